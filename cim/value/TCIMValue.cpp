@@ -1,0 +1,1 @@
+#include "TCIMValue.h"

@@ -1,0 +1,70 @@
+# How everything here is compiled: warnings, sanitizers, where the results go, and the functions that make rooms,
+# platform libraries, plug-ins and tests.
+
+find_package(Boost 1.74 REQUIRED COMPONENTS thread)
+find_package(Threads REQUIRED)
+
+if(NOT CMAKE_BUILD_TYPE)
+  set(CMAKE_BUILD_TYPE Release CACHE STRING "" FORCE)
+endif()
+set(CMAKE_EXPORT_COMPILE_COMMANDS ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+set(CMAKE_CXX_VISIBILITY_PRESET hidden)
+set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
+
+find_program(ZEP_CCACHE ccache)
+if(ZEP_CCACHE)
+  set(CMAKE_CXX_COMPILER_LAUNCHER ${ZEP_CCACHE})
+endif()
+if(ZEP_TIDY)
+  set(CMAKE_CXX_CLANG_TIDY clang-tidy)
+endif()
+
+# The build tree looks like the installed one: what is loaded at run time lies together, test plug-ins elsewhere.
+set(ZEP_LIB_DIR ${PROJECT_BINARY_DIR}/lib)
+set(ZEP_BIN_DIR ${PROJECT_BINARY_DIR}/bin)
+set(ZEP_TEST_DIR ${PROJECT_BINARY_DIR}/tests)
+
+add_library(zep_options INTERFACE)
+target_compile_features(zep_options INTERFACE cxx_std_17)
+target_compile_definitions(zep_options INTERFACE BOOST_ENABLE_ASSERT_HANDLER)
+target_compile_options(zep_options INTERFACE -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Werror)
+target_link_libraries(zep_options INTERFACE Boost::headers)
+if(ZEP_SANITIZE)
+  target_compile_options(zep_options INTERFACE -fsanitize=${ZEP_SANITIZE} -fno-omit-frame-pointer -fno-sanitize-recover=all)
+  target_link_options(zep_options INTERFACE -fsanitize=${ZEP_SANITIZE})
+  add_link_options(-fsanitize=${ZEP_SANITIZE})
+endif()
+
+# A room of libzepcore.so. It sees the public headers and, as "room/Header.h", the private ones; which rooms it may
+# name there is checked by tests/house.
+function(zep_room name)
+  add_library(${name} OBJECT ${ARGN})
+  target_link_libraries(${name} PRIVATE zep_options)
+  target_include_directories(${name} PRIVATE ${PROJECT_SOURCE_DIR}/include ${PROJECT_SOURCE_DIR})
+endfunction()
+
+# A library that is loaded at run time and lies beside libzepcore.so under exactly the name given.
+function(zep_loaded_library name file)
+  add_library(${name} MODULE ${ARGN})
+  target_link_libraries(${name} PRIVATE zep_options)
+  set_target_properties(${name} PROPERTIES PREFIX "" OUTPUT_NAME ${file} SUFFIX ""
+    LIBRARY_OUTPUT_DIRECTORY ${ZEP_LIB_DIR} BUILD_RPATH "$ORIGIN" INSTALL_RPATH "$ORIGIN" BUILD_WITH_INSTALL_RPATH ON)
+endfunction()
+
+# A test program of GoogleTest; each of its tests becomes one of ctest's. LIBS are linked, the library always.
+function(zep_test name)
+  cmake_parse_arguments(ARG "" "TIMEOUT" "SOURCES;LIBS;LABELS;ENVIRONMENT" ${ARGN})
+  if(NOT ARG_TIMEOUT)
+    set(ARG_TIMEOUT 60)
+  endif()
+  add_executable(${name} ${ARG_SOURCES})
+  target_link_libraries(${name} PRIVATE zep_options zepcore ${ARG_LIBS} GTest::gmock GTest::gtest_main Threads::Threads)
+  target_include_directories(${name} PRIVATE ${PROJECT_SOURCE_DIR})
+  target_compile_definitions(${name} PRIVATE ZEP_SOURCE_DIR="${PROJECT_SOURCE_DIR}" ZEP_BUILD_DIR="${PROJECT_BINARY_DIR}"
+                                             ZEP_TEST_DATA_DIR="${PROJECT_SOURCE_DIR}/tests/data")
+  set_target_properties(${name} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${ZEP_TEST_DIR})
+  gtest_discover_tests(${name} TEST_PREFIX "${name}." DISCOVERY_MODE PRE_TEST DISCOVERY_TIMEOUT 60
+    PROPERTIES TIMEOUT ${ARG_TIMEOUT} LABELS "${ARG_LABELS}" ENVIRONMENT "${ARG_ENVIRONMENT}")
+endfunction()

@@ -1,0 +1,59 @@
+#pragma once
+
+#include <dirent.h>
+#include <dlfcn.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <memory>
+#include <utility>
+
+namespace NQRVZEP20 {
+
+// Owners of what the operating system hands out. Each releases it when it goes out of scope and can be moved, not copied;
+// release() lets go without releasing.
+
+struct TFileCloser {
+  void operator()(std::FILE* file) const noexcept { std::fclose(file); }
+};
+using TUniqueFile = std::unique_ptr<std::FILE, TFileCloser>;
+
+struct TDirCloser {
+  void operator()(DIR* dir) const noexcept { ::closedir(dir); }
+};
+using TUniqueDir = std::unique_ptr<DIR, TDirCloser>;
+
+struct TLibraryCloser {
+  void operator()(void* library) const noexcept { ::dlclose(library); }
+};
+using TSharedLibrary = std::unique_ptr<void, TLibraryCloser>;
+
+// The function of that name in a library, or null.
+template <class TFunction>
+TFunction* FunctionOf(void* library, char const* name) {
+  return reinterpret_cast<TFunction*>(::dlsym(library, name));
+}
+
+class TUniqueFd {
+public:
+  explicit TUniqueFd(int fd = -1) noexcept : fFd(fd) {}
+  TUniqueFd(TUniqueFd&& other) noexcept : fFd(other.release()) {}
+  TUniqueFd& operator=(TUniqueFd&& other) noexcept {
+    reset(other.release());
+    return *this;
+  }
+  ~TUniqueFd() { reset(); }
+
+  int get() const noexcept { return fFd; }
+  explicit operator bool() const noexcept { return fFd >= 0; }
+  int release() noexcept { return std::exchange(fFd, -1); }
+  void reset(int fd = -1) noexcept {
+    if (fFd >= 0) ::close(fFd);
+    fFd = fd;
+  }
+
+private:
+  int fFd;  // -1: none
+};
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,23 @@
+#pragma once
+
+#include "ICIMElement.h"
+
+namespace NQRVZEP20 {
+
+class ICIMPropertyDecl;
+
+// One property value: of an instance, or of a class itself (a static property).
+class ZEP_EXPORT ICIMProperty {
+public:
+  virtual ~ICIMProperty();
+
+  virtual TCIMValue GetValue(TCIMContext const& context) const = 0;
+
+  // Throws kZEPStatusTypeMismatch when the value's type, NULL or not, is not the declared one.
+  virtual void SetValue(TCIMValue const& value, TCIMContext const& context) = 0;
+
+  virtual std::string GetName(TCIMContext const& context) const = 0;  // spelled as declared
+  virtual boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(TCIMContext const& context) const = 0;
+};
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,24 @@
+#pragma once
+
+#include "ICIMElement.h"
+
+namespace NQRVZEP20 {
+
+class ICIMNamedElement;
+class ICIMQualifierDecl;
+
+// A qualifier as it is written on one element: a name, a value and a flavor.
+class ZEP_EXPORT ICIMQualifier {
+public:
+  virtual ~ICIMQualifier();
+
+  virtual std::string GetName(TCIMContext const& context) const = 0;  // spelled as declared
+  virtual TCIMValue GetValue(TCIMContext const& context) const = 0;
+  virtual unsigned int GetFlavor(TCIMContext const& context) const = 0;  // a set of ICIMQualifierDecl::EFlavor
+  virtual boost::shared_ptr<ICIMQualifierDecl> GetDeclaration(TCIMContext const& context) const = 0;
+
+  // The element that it is written on.
+  virtual boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const = 0;
+};
+
+}  // namespace NQRVZEP20

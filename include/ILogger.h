@@ -1,0 +1,41 @@
+#pragma once
+
+#include "TCIMDateTime.h"
+#include "ZEPExport.h"
+
+#include <list>
+#include <string>
+
+namespace NQRVZEP20 {
+
+// The library's one channel for diagnostic text. TRootObject::GetCoreLogger() hands out the calling thread's logger;
+// TLogger says what each operation does.
+class ZEP_EXPORT ILogger {
+public:
+  enum EZEPLogSeverity : int {
+    kLogError = 0,
+    kLogWarning = 1,
+    kLogStatus = 2,
+    kLogDebug = 3,
+    kLogVerbose = 4,
+    kLogMemoryOnly = 100,       // recorded in the in-memory list, whatever the threshold; never written
+    kLogMemoryOnlyAlways = 101  // the same; only the recorded severity differs
+  };
+
+  // One recorded entry.
+  struct TLogEntry {
+    EZEPLogSeverity fSeverity;
+    std::string fMessage;     // as passed: no label, no time, no newline
+    TCIMDateTime fTimeStamp;  // the local time at which it was recorded
+  };
+
+  virtual ~ILogger();
+  virtual void OutputLogEntry(EZEPLogSeverity severity, std::string const& message) = 0;
+  virtual void SysLogEntry(EZEPLogSeverity severity, std::string const& message) = 0;
+  virtual std::list<TLogEntry>& GetLog() = 0;
+  virtual void ClearLog() = 0;
+  virtual EZEPLogSeverity GetLogThreshold() = 0;
+  virtual void SetLogFilename(std::string path) = 0;
+};
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,209 @@
+#pragma once
+
+#include "TCIMChar16.h"
+#include "TCIMDateTime.h"
+#include "ZEPExport.h"
+
+#include <boost/shared_ptr.hpp>
+
+#include <iosfwd>
+#include <map>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+class ICIMClass;
+class ICIMNamespace;
+class TCIMReference;
+class TCIMValueImpl;
+
+// One typed CIM value: every property value, method argument, key value and array element that crosses the library.
+//
+// A value is a type tag and, unless it is NULL, the data. A NULL value has a tag all the same: a property can be a NULL
+// uint32, or a NULL array of string with at most 8 elements. Copies are deep and share nothing but the referenced class.
+// Conversions out of a value are strict: the requested type must be exactly the stored one. Not synchronised: concurrent
+// reads are safe, a write needs exclusive access.
+class ZEP_EXPORT TCIMValue {
+public:
+  // The type tag: a CIM intrinsic type, and whether it is an array of that type.
+  class ZEP_EXPORT TCIMType {
+  public:
+    enum ECIMType {
+      kCIMTypeInvalid = 0,  // the tag of a default-constructed value
+      kCIMTypeBoolean = 1,
+      kCIMTypeUint8 = 2,
+      kCIMTypeSint8 = 3,
+      kCIMTypeUint16 = 4,
+      kCIMTypeSint16 = 5,
+      kCIMTypeUint32 = 6,
+      kCIMTypeSint32 = 7,
+      kCIMTypeUint64 = 8,
+      kCIMTypeSint64 = 9,
+      kCIMTypeReal32 = 10,
+      kCIMTypeReal64 = 11,
+      kCIMTypeChar16 = 12,
+      kCIMTypeString = 13,
+      kCIMTypeDateTime = 14,
+      kCIMTypeReference = 15,
+      kCIMTypeArrayFlag = 16  // added to a base type: an array of that type
+    };
+
+    TCIMType(ECIMType type) noexcept : fType(type) {}
+
+    // The type of that CIM name ("uint8", "string", ...), in any mix of upper and lower case. There is no array syntax. An
+    // unknown name raises no error: the tag is then kCIMTypeInvalid.
+    TCIMType(std::string name);
+
+    operator ECIMType() const noexcept { return fType; }
+
+    // The CIM name of the base type: an array of sint32 prints "sint32", with no array mark. Throws
+    // kZEPStatusTypeMismatch for tag 0 and for a base type above 15.
+    std::string ToString() const;
+
+  private:
+    ECIMType fType;
+  };
+
+  // ---- Construction. Each form below starts from the default state and calls the Set of the same arguments. ----
+
+  // NULL, tag 0, no referenced class, maximum array size 0.
+  TCIMValue() noexcept;
+
+  // A NULL value of that type. An `arraySize` other than 0 makes it an array with that declared bound.
+  TCIMValue(TCIMType type, unsigned int arraySize);
+
+  TCIMValue(bool value);
+  TCIMValue(unsigned char value);
+  TCIMValue(signed char value);
+  TCIMValue(unsigned short value);
+  TCIMValue(short value);
+  TCIMValue(unsigned int value);
+  TCIMValue(int value);
+  TCIMValue(unsigned long value);
+  TCIMValue(long value);
+  TCIMValue(float value);
+  TCIMValue(double value);
+  TCIMValue(TCIMChar16 const& value);
+  TCIMValue(char const* value);
+  TCIMValue(std::string const& value);
+  TCIMValue(TCIMDateTime const& value);
+  TCIMValue(TCIMReference& value);
+  TCIMValue(TCIMType type, unsigned int maxArraySize, std::vector<TCIMValue> const& elements);
+
+  // A scalar read from its text, which is not modified; `ns` serves references only. Numbers are read as a standard stream
+  // in the classic locale reads them, in decimal: leading white space is skipped, reading stops at the first character that
+  // cannot go on with the number, and what cannot be read is 0. uint8 and sint8 are read as 32-bit numbers and cut to
+  // 8 bits without a range check. A boolean is the word "true" or "false". A char16 is NULL whatever the text says (see
+  // TCIMChar16). Throws kZEPStatusTypeMismatch for tag 0, tags above 15 and arrays, kZEPStatusInvalidDateTime for a
+  // malformed datetime, and what TCIMReference::SetPath throws for a malformed reference.
+  TCIMValue(TCIMType type, std::string& text, boost::shared_ptr<ICIMNamespace> ns);
+
+  TCIMValue(TCIMValue const& other);
+  TCIMValue(TCIMValue&& other) noexcept;  // leaves `other` in the default state
+  ~TCIMValue();
+
+  // ---- Assignment ----
+
+  // Assignment first asks whether the two are equal (so it throws what == throws) and then changes nothing at all: a NULL
+  // reference that compares equal keeps its own referenced class, an equal array its own maximum size. Otherwise the tag
+  // and the data are taken over, the maximum array size only for an array, the referenced class only for a reference.
+  // A value may be assigned from itself or from one of its own elements.
+  TCIMValue& operator=(TCIMValue const& other);
+  TCIMValue& operator=(TCIMValue&& other);
+  void Set(TCIMValue const& other);
+
+  // Makes this NULL with exactly that type. Only for an array type is the maximum array size set.
+  void SetNullValue(TCIMType::ECIMType type, unsigned int arraySize);
+
+  // These replace the data and the tag; the referenced class and the maximum array size stay as they are.
+  void Set(bool value);
+  void Set(unsigned char value);
+  void Set(signed char value);
+  void Set(unsigned short value);
+  void Set(short value);
+  void Set(unsigned int value);
+  void Set(int value);
+  void Set(unsigned long value);
+  void Set(long value);
+  void Set(float value);
+  void Set(double value);
+  void Set(TCIMChar16 const& value);
+  void Set(char const* value);
+  void Set(std::string const& value);
+  void Set(TCIMDateTime const& value);
+
+  // Also sets the referenced class, to the reference's class.
+  void Set(TCIMReference& value);
+
+  // Makes this an array of `type` holding a copy of the elements. `maxArraySize` is the declared bound, 0 for none; it is
+  // never compared with the number of elements. An element of another type is logged as an error and throws
+  // kZEPStatusInvalidProperty (kZEPStatusTypeMismatch, unlogged, when its tag has no name). That check comes after the
+  // assignment: the value keeps the new array.
+  void Set(TCIMType type, unsigned int maxArraySize, std::vector<TCIMValue> const& elements);
+
+  // Only a NULL value takes a referenced class; otherwise throws kZEPStatusInvalidOpSequence and changes nothing.
+  void SetReferencedClass(boost::shared_ptr<ICIMClass> referencedClass);
+
+  // ---- Queries ----
+
+  bool IsNull() const noexcept { return !fImpl; }
+  TCIMType GetType() const noexcept { return fType; }
+  bool IsArray() const noexcept { return (fType & TCIMType::kCIMTypeArrayFlag) != 0; }
+  bool IsReference() const noexcept { return fType == TCIMType::kCIMTypeReference; }  // an array of references is not one
+  unsigned int GetMaxArraySize() const noexcept { return fMaxArraySize; }             // 0: unbounded, or not an array
+  boost::shared_ptr<ICIMClass> GetReferencedClass() const { return fReferencedClass; }  // may be empty
+
+  // ---- Conversions. Each throws kZEPStatusValueIsNULL for a NULL value, else kZEPStatusTypeMismatch unless the tag is
+  //      exactly that of the type asked for. A char16 is read through its text. ----
+
+  operator bool() const;
+  operator unsigned char() const;
+  operator signed char() const;
+  operator unsigned short() const;
+  operator short() const;
+  operator unsigned int() const;
+  operator int() const;
+  operator unsigned long() const;
+  operator long() const;
+  operator float() const;
+  operator double() const;
+  operator std::string() const;
+  operator TCIMDateTime() const;
+  operator TCIMReference() const;
+
+  // The elements themselves, to be read or edited in place; edits are checked against nothing. The reference lives until
+  // the value is next changed or destroyed.
+  operator std::vector<TCIMValue>&() const;
+
+  // The value as text. `radix` is 8, 10 or 16 and concerns unsigned integers: base 16 is in capitals and filled with zeros
+  // to the width of the type. Throws kZEPStatusValueIsNULL for a NULL value or element, and kZEPStatusNotSupported for
+  // another radix, or for 8 and 16 with a signed or real number. Strings are neither quoted nor escaped; an array is
+  // "{ a, b }"; strings, datetimes, char16 and references ignore the radix.
+  std::string ToString(unsigned char radix = 10) const;
+
+  // ---- Comparisons. NULL sorts first, then the order is that of the tags, then that of the data. <= and > ask == first.
+  //      Comparing two arrays of one type with < throws kZEPStatusNotImplemented. ----
+
+  bool operator==(TCIMValue const& other) const;
+  bool operator<(TCIMValue const& other) const;
+  bool operator!=(TCIMValue const& other) const { return !(*this == other); }
+  bool operator>=(TCIMValue const& other) const { return !(*this < other); }
+  bool operator<=(TCIMValue const& other) const { return *this == other || *this < other; }
+  bool operator>(TCIMValue const& other) const { return !(*this == other) && !(*this < other); }
+
+private:
+  TCIMType fType;
+  std::unique_ptr<TCIMValueImpl> fImpl;  // null means the value is NULL; never shared
+  boost::shared_ptr<ICIMClass> fReferencedClass;
+  unsigned int fMaxArraySize;
+};
+
+// Writes the type's name, as TCIMType::ToString gives and throws it.
+ZEP_EXPORT std::ostream& operator<<(std::ostream& stream, TCIMValue::TCIMType const& type);
+
+// What a caller carries along with an object model operation, by name. Empty unless an operation says otherwise.
+using TCIMContext = std::map<std::string, TCIMValue>;
+
+}  // namespace NQRVZEP20

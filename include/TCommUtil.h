@@ -1,0 +1,26 @@
+#pragma once
+
+#include "ZEPExport.h"
+
+#include <string>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+// String and path utilities. Static operations only; no state, any thread.
+class ZEP_EXPORT TCommUtil {
+public:
+  TCommUtil() {}
+
+  // Appends the pieces of `path` between separators to `parts`. With `keepSeparator` each piece ends in the separator's
+  // first character. Only one character is stepped over at each separator, however long it is. "/var/log" gives
+  // "", "var", "log", or "/", "var/", "log"; a trailing separator gives no empty last piece, an empty path nothing.
+  static void SplitPath(std::string const& path, std::vector<std::string>& parts, std::string const& separator,
+                        bool keepSeparator);
+
+  // Creates every missing directory along the path. Throws what TOSSpecific::CreateDir throws, and leaves the directories
+  // made until then; a plain file in the way is kZEPStatusDirectoryAlreadyExists.
+  static void MkDirHier(std::string const& path);
+};
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,26 @@
+#pragma once
+
+#include "INamespaceProviderManager.h"
+
+#include <map>
+
+namespace NQRVZEP20 {
+
+// The one registry of the process. Made when the library is loaded; it and its providers live until the process ends.
+class ZEP_EXPORT TNamespaceProviderManager : public INamespaceProviderManager {
+public:
+  static boost::shared_ptr<TNamespaceProviderManager> GetInstance();
+
+  ~TNamespaceProviderManager() override;
+
+  void RegisterNamespaceProvider(boost::shared_ptr<INamespaceProvider> provider) override;
+  boost::shared_ptr<INamespaceProvider> GetNamespaceProvider(std::string const& name) const override;
+  void EnumerateNamespaceProviders(boost::function<bool(boost::shared_ptr<INamespaceProvider>)> callback) override;
+
+private:
+  std::map<std::string, boost::shared_ptr<INamespaceProvider>> fProviders;  // by name, in byte order
+
+  static boost::shared_ptr<TNamespaceProviderManager> fgInstance;
+};
+
+}  // namespace NQRVZEP20

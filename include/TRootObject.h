@@ -1,0 +1,19 @@
+#pragma once
+
+#include "INamespaceProviderManager.h"
+#include "ZEPExport.h"
+
+namespace NQRVZEP20 {
+
+class ILogger;
+
+// Where a host starts: the way to the process-wide objects.
+class ZEP_EXPORT TRootObject {
+public:
+  static boost::shared_ptr<INamespaceProviderManager> GetNamespaceProviderManager();
+
+  // The calling thread's logger. The library's own; never null.
+  static ILogger* GetCoreLogger();
+};
+
+}  // namespace NQRVZEP20

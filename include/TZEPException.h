@@ -1,0 +1,25 @@
+#pragma once
+
+#include "TZEPStatusCode.h"
+
+#include <exception>
+
+namespace NQRVZEP20 {
+
+// The library's exception: one status code. Thrown by value, caught by reference; `catch (TZEPException const& e)`.
+class ZEP_EXPORT TZEPException : public std::exception {
+public:
+  TZEPException(TZEPStatusCode code) noexcept : fStatusCode(code) {}
+  TZEPException(EZEPStatusCode code) noexcept : fStatusCode(code) {}
+  ~TZEPException() override;
+
+  // The name of the held code, such as "kZEPStatusTypeMismatch". Valid to the end of the process.
+  char const* what() const noexcept override;
+
+  TZEPStatusCode const& GetStatusCode() const noexcept { return fStatusCode; }
+
+private:
+  TZEPStatusCode fStatusCode;
+};
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,88 @@
+#pragma once
+
+// What the tests of every room share.
+
+#include "ILogger.h"
+#include "TRootObject.h"
+#include "TZEPException.h"
+
+#include <gtest/gtest.h>
+#include <stdlib.h>
+
+#include <exception>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <string>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+// Expects that the statement throws TZEPException with that status.
+#define EXPECT_STATUS(statement, status)                                             \
+  EXPECT_THROW(                                                                      \
+      {                                                                              \
+        try {                                                                        \
+          statement;                                                                 \
+        } catch (::NQRVZEP20::TZEPException const& thrown) {                         \
+          EXPECT_STREQ(thrown.what(), ::NQRVZEP20::TZEPException(status).what());    \
+          throw;                                                                     \
+        }                                                                            \
+      },                                                                             \
+      ::NQRVZEP20::TZEPException)
+
+// A fresh directory, removed with everything in it at the end.
+class TTempDir {
+public:
+  TTempDir() {
+    std::string pattern = (std::filesystem::temp_directory_path() / "zep-test.XXXXXX").string();
+    if (::mkdtemp(pattern.data()) == nullptr) throw std::runtime_error("no temporary directory");
+    fPath = pattern;
+  }
+  ~TTempDir() {
+    std::error_code ignored;
+    std::filesystem::remove_all(fPath, ignored);
+  }
+  TTempDir(TTempDir const&) = delete;
+  TTempDir& operator=(TTempDir const&) = delete;
+
+  std::string Path() const { return fPath; }
+  std::string Path(std::string const& name) const { return fPath + "/" + name; }
+
+private:
+  std::string fPath;
+};
+
+// Sets or unsets (nullptr) an environment variable, and puts it back at the end.
+class TEnvironmentGuard {
+public:
+  TEnvironmentGuard(char const* name, char const* value) : fName(name) {
+    if (char const* old = ::getenv(name)) fOld = std::string(old), fWasSet = true;
+    value ? ::setenv(name, value, 1) : ::unsetenv(name);
+  }
+  ~TEnvironmentGuard() { fWasSet ? ::setenv(fName.c_str(), fOld.c_str(), 1) : ::unsetenv(fName.c_str()); }
+  TEnvironmentGuard(TEnvironmentGuard const&) = delete;
+  TEnvironmentGuard& operator=(TEnvironmentGuard const&) = delete;
+
+private:
+  std::string fName, fOld;
+  bool fWasSet = false;
+};
+
+inline std::string ReadFile(std::string const& path) {
+  std::ifstream file(path, std::ios::binary);
+  std::ostringstream text;
+  text << file.rdbuf();
+  return text.str();
+}
+
+inline void WriteFile(std::string const& path, std::string const& text) { std::ofstream(path, std::ios::binary) << text; }
+
+// The messages that the in-memory log holds (severities up to Status), oldest first.
+inline std::vector<std::string> LoggedMessages() {
+  std::vector<std::string> messages;
+  for (auto const& entry : TRootObject::GetCoreLogger()->GetLog()) messages.push_back(entry.fMessage);
+  return messages;
+}
+
+}  // namespace NQRVZEP20
