@@ -3,6 +3,7 @@
 // What the tests of every room share.
 
 #include "ILogger.h"
+#include "TLogger.h"
 #include "TRootObject.h"
 #include "TZEPException.h"
 
@@ -12,8 +13,11 @@
 #include <exception>
 #include <filesystem>
 #include <fstream>
+#include <regex>
 #include <sstream>
+#include <stdexcept>
 #include <string>
+#include <thread>
 #include <vector>
 
 namespace NQRVZEP20 {
@@ -83,6 +87,46 @@ inline std::vector<std::string> LoggedMessages() {
   std::vector<std::string> messages;
   for (auto const& entry : TRootObject::GetCoreLogger()->GetLog()) messages.push_back(entry.fMessage);
   return messages;
+}
+
+// Lets everything through to a log file of the calling thread, and puts the threshold back at the end. Use it on a thread
+// of the test's own (OnNewThread) when the test needs the thread's logger untouched before and after.
+class TLogCapture {
+public:
+  TLogCapture() : fOldThreshold(TLogger::GetInstance()->GetLogThreshold()) {
+    TLogger::SetLogThreshold(ILogger::kLogVerbose);
+    TLogger::GetInstance()->SetLogFilename(fDir.Path("log"));
+  }
+  ~TLogCapture() { TLogger::SetLogThreshold(fOldThreshold); }
+  TLogCapture(TLogCapture const&) = delete;
+  TLogCapture& operator=(TLogCapture const&) = delete;
+
+  // What was written so far, without times: "[Debug] getMachineType() entered.". A message of several lines is one element.
+  std::vector<std::string> Entries() const {
+    std::vector<std::string> entries;
+    std::istringstream log(ReadFile(fDir.Path("log")));
+    std::string line;
+    std::getline(log, line);  // the opening banner
+    while (std::getline(log, line)) {
+      static std::regex const head("FDR_(\\[[A-Z][a-z]+\\] )\\d+/\\d+/\\d+  \\d+:\\d+:\\d+ ");
+      std::smatch match;
+      if (std::regex_search(line, match, head, std::regex_constants::match_continuous))
+        entries.push_back(match[1].str() + match.suffix().str());
+      else if (!entries.empty())
+        entries.back() += "\n" + line;
+    }
+    return entries;
+  }
+
+private:
+  TTempDir fDir;
+  ILogger::EZEPLogSeverity fOldThreshold;
+};
+
+// Runs the function on a thread of its own, which has a fresh logger that ends with it.
+template <class TFunction>
+void OnNewThread(TFunction function) {
+  std::thread(function).join();
 }
 
 }  // namespace NQRVZEP20
