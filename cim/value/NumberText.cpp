@@ -17,7 +17,7 @@ constexpr std::size_t kLongestText = 24;  // a uint64 in base 8 has 22 digits
 template <class... TArguments>
 std::string ToChars(TArguments... arguments) {
   char buffer[kLongestText];
-  char const* const end = std::to_chars(buffer, buffer + sizeof buffer, arguments...).ptr;
+  char* const end = std::to_chars(buffer, buffer + sizeof buffer, arguments...).ptr;
   return std::string(buffer, end);
 }
 

@@ -12,9 +12,9 @@ using TType = TCIMValue::TCIMType;
 namespace {
 
 // The stored number, read without a virtual call.
-template <class TNumber>
-TNumber Stored(TCIMNumericValueImpl const& data) {
-  return data.TCIMNumericValueImpl::operator TNumber();
+template <class TNumber, class TData>
+TNumber Stored(TData const& data) {
+  return data.TData::operator TNumber();
 }
 
 // Calls `function` with the stored number.
