@@ -67,7 +67,7 @@ public:
   static std::string const libx86IntrAddrFile;       // "/tmp/intr_address.tmp"
 
   // The directory that holds the loaded core library, without a trailing separator. Throws kZEPStatusFileSystemError when
-  // the dynamic linker does not know it.
+  // the dynamic linker does not know it, or names the library with more than 511 bytes.
   static std::string GetZEPRootPath();
 
   // The full paths of the plug-ins of that kind in the subdirectories of `root`, in byte order. A name counts when it
@@ -76,8 +76,8 @@ public:
   static std::vector<std::string> FindPlugins(std::string root);  // of the kind "pi"
 
   // The base names of the libraries of that kind in the root path, in directory order: every non-directory whose name
-  // holds ".<kind>", less its first three and last seven characters, whatever these are. Throws
-  // kZEPStatusFileSystemError when the root path cannot be opened.
+  // holds ".<kind>", less its first three and last seven characters, whatever these are (a shorter name gives an empty
+  // base name). Throws kZEPStatusFileSystemError when the root path cannot be opened.
   static std::vector<std::string> FindNSServices(std::string kind);
   static std::vector<std::string> FindNSPs();  // of the kind "nsp"
   static std::vector<std::string> FindNSCs();  // of the kind "nsc"
@@ -98,7 +98,8 @@ public:
   static void LoadNSPLibrary(std::string baseName);
 
   // Loads "<root path>/lib<baseName>.nsc.so" and makes the consumer with its function <baseName>_CreateINamespaceConsumer;
-  // the caller owns it. Fails as above; a missing function is logged as an error and throws kZEPStatusNotFound.
+  // the caller owns it. Fails as above; a missing function is logged as an error and throws kZEPStatusNotFound, and the
+  // library stays loaded.
   static INamespaceConsumer* LoadNSCLibrary(std::string baseName);
 
   // ---- Machine identification (TOSSpecificMachine.cpp) ----
