@@ -20,8 +20,6 @@ class ZEP_EXPORT TOSSpecific {
 public:
   // ---- Files, directories, paths and environment (TOSSpecificFiles.cpp) ----
 
-  static std::string const kFileSeparator;  // "/"
-
   // False for a directory and for what is not there; devices, pipes and sockets count as files. Links are followed.
   static bool FileExists(std::string path);
   static bool DirExists(std::string path);
@@ -59,6 +57,7 @@ public:
   // the core library; collection plug-ins ("pi") one level below a plug-in root. Nothing is remembered between calls, and
   // a loaded library is never unloaded.
 
+  static std::string const kFileSeparator;           // "/"
   static std::string const kDynamicModuleExtension;  // ".so"
   static std::string const kZEPPluginExtension;      // "pi"
   static std::string const kPluginExtension;         // ".pi.so"
