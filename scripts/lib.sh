@@ -1,0 +1,41 @@
+# Shared by the scripts here: finding the root, installing packages, building. To be sourced.
+
+cd "$(dirname "${BASH_SOURCE[0]}")/.."
+install=yes
+
+# Takes --no-install out of the arguments; the rest is left in `arguments`.
+parse_common_arguments() {
+  arguments=()
+  for argument in "$@"; do
+    if [[ $argument == --no-install ]]; then install=no; else arguments+=("$argument"); fi
+  done
+}
+
+# Installs the packages of the jobs named, as far as they are missing, and says so.
+need_packages() {
+  local job package missing=()
+  for job in "$@"; do
+    for package in $(sed -n "s/^$job: //p" scripts/packages); do
+      dpkg-query -W -f '${Status}' "$package" 2>/dev/null | grep -q 'ok installed' || missing+=("$package")
+    done
+  done
+  [[ ${#missing[@]} -gt 0 ]] || return 0
+  if [[ $install == no ]]; then
+    echo "Missing packages (not installed, as asked): ${missing[*]}" >&2
+    return 0
+  fi
+  local as_root=()
+  [[ $(id -u) == 0 ]] || as_root=(sudo)
+  echo "Installing what is missing: ${missing[*]}"
+  "${as_root[@]}" apt-get update -qq
+  "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive apt-get install -y -qq --no-install-recommends "${missing[@]}" >/dev/null
+}
+
+# Configures and builds a preset: build PRESET [TARGET...]
+build() {
+  local preset=$1
+  shift
+  cmake --preset "$preset" >build-configure.log 2>&1 || { cat build-configure.log; rm -f build-configure.log; return 1; }
+  rm -f build-configure.log
+  cmake --build --preset "$preset" ${1:+--target "$@"}
+}

@@ -1,0 +1,144 @@
+// The rules of the house: which room may name which, and what libzepcore.so shows of itself.
+
+#include "tests/Support.h"
+
+#include <gtest/gtest.h>
+
+#include <array>
+#include <cstdio>
+#include <map>
+#include <memory>
+#include <set>
+
+namespace NQRVZEP20 {
+namespace {
+
+namespace fs = std::filesystem;
+
+struct TRoom {
+  char const* folder;
+  std::vector<std::string> mayName;  // the rooms whose headers it may include, besides itself
+};
+
+TRoom const kRooms[] = {
+    {"include", {}},
+    {"core", {"include"}},
+    {"cim/value", {"include", "core"}},
+    {"cim/model", {"include", "core", "cim/value"}},
+    {"os", {"include", "core", "platform/include"}},
+    {"ipmi", {"include", "core", "platform/include"}},
+    {"proxy", {"include", "core"}},
+    {"platform/smbios", {"platform/include"}},
+    {"platform/ipmi", {"platform/include"}},
+    {"platform/usblan", {"platform/include"}},
+    {"providers/memory", {"include"}},
+    {"providers/host", {"include", "providers/memory", "platform/include"}},
+    {"tools/zep", {"include"}},
+};
+
+fs::path const kSource = ZEP_SOURCE_DIR;
+
+std::vector<fs::path> SourcesOf(std::string const& folder) {
+  std::vector<fs::path> sources;
+  if (!fs::exists(kSource / folder)) return sources;
+  for (auto const& entry : fs::directory_iterator(kSource / folder)) {
+    std::string const extension = entry.path().extension().string();
+    if (extension == ".h" || extension == ".cpp") sources.push_back(entry.path());
+  }
+  return sources;
+}
+
+std::vector<std::string> QuotedIncludesOf(fs::path const& source) {
+  static std::regex const include(R"re(^\s*#\s*include\s*"([^"]+)")re");
+  std::vector<std::string> names;
+  std::ifstream file(source);
+  std::smatch match;
+  for (std::string line; std::getline(file, line);)
+    if (std::regex_search(line, match, include)) names.push_back(match[1]);
+  return names;
+}
+
+// The room that an include names: beside the source, from the root ("core/Log.h"), or one of the flat public folders.
+std::string RoomNamedBy(std::string const& include, fs::path const& source) {
+  if (fs::exists(kSource / include)) return fs::path(include).parent_path().string();
+  if (fs::exists(source.parent_path() / include)) return fs::relative(source.parent_path(), kSource).string();
+  for (char const* flat : {"include", "platform/include", "providers/memory"})
+    if (fs::exists(kSource / flat / include)) return flat;
+  return "nowhere";
+}
+
+TEST(HouseTest, RoomsNameOnlyTheRoomsTheyMay) {
+  int checked = 0;
+  for (TRoom const& room : kRooms) {
+    std::set<std::string> allowed(room.mayName.begin(), room.mayName.end());
+    allowed.insert(room.folder);
+    for (fs::path const& source : SourcesOf(room.folder))
+      for (std::string const& include : QuotedIncludesOf(source)) {
+        std::string const named = RoomNamedBy(include, source);
+        EXPECT_TRUE(allowed.count(named)) << source << " includes \"" << include << "\", which is of " << named;
+        ++checked;
+      }
+  }
+  EXPECT_GT(checked, 100);
+}
+
+TEST(HouseTest, EveryPublicHeaderIsInTheOneThatIncludesThemAll) {
+  std::set<std::string> const all = [] {
+    auto const names = QuotedIncludesOf(kSource / "include/zepcore.h");
+    return std::set<std::string>(names.begin(), names.end());
+  }();
+  for (fs::path const& header : SourcesOf("include")) {
+    std::string const name = header.filename().string();
+    EXPECT_TRUE(name == "zepcore.h" || all.count(name)) << header;
+  }
+}
+
+std::string OutputOf(std::string const& command) {
+  std::unique_ptr<FILE, int (*)(FILE*)> const pipe(::popen(command.c_str(), "r"), ::pclose);
+  std::string output;
+  std::array<char, 4096> chunk;
+  while (std::size_t const got = std::fread(chunk.data(), 1, chunk.size(), pipe.get())) output.append(chunk.data(), got);
+  return output;
+}
+
+// The names of the library's dynamic symbol table that it defines itself.
+std::vector<std::string> ExportedSymbols() {
+  std::vector<std::string> symbols;
+  std::istringstream lines(OutputOf("nm -D -C --defined-only " ZEP_LIBRARY));
+  for (std::string line; std::getline(lines, line);)
+    if (line.size() > 19) symbols.push_back(line.substr(19));
+  return symbols;
+}
+
+TEST(HouseTest, OnlyPublicSymbolsAreExported) {
+  static std::regex const isPublic(
+      R"(^((typeinfo|typeinfo name|vtable) for )?(NQRVZEP20::|boost::assertion_failed|AutoProxyDiscovery|TCopy|copyInstMutex))"
+      R"(|^(non-virtual |virtual )?thunk to NQRVZEP20::|^guard variable for NQRVZEP20::)");
+  std::vector<std::string> const symbols = ExportedSymbols();
+  EXPECT_GT(symbols.size(), 100u);
+  for (std::string const& symbol : symbols) {
+    if (symbol.rfind("__", 0) == 0) continue;  // of a sanitizer's run time
+    EXPECT_TRUE(std::regex_search(symbol, isPublic)) << symbol;
+  }
+}
+
+TEST(HouseTest, WhatIsThrownAndCastAcrossLibrariesIsExported) {
+  std::vector<std::string> const list = ExportedSymbols();
+  std::set<std::string> const symbols(list.begin(), list.end());
+  for (char const* name : {"TZEPException", "TBoostAssertException", "ICIMClass", "ICIMInstance", "ICIMNamespace", "ILogger",
+                           "INamespaceProvider", "INamespaceConsumer", "TCIMValueImpl"})
+    EXPECT_TRUE(symbols.count(std::string("typeinfo for NQRVZEP20::") + name)) << name;
+  EXPECT_TRUE(symbols.count("boost::assertion_failed(char const*, char const*, char const*, long)"));
+  EXPECT_TRUE(symbols.count("boost::assertion_failed_msg(char const*, char const*, char const*, char const*, long)"));
+}
+
+TEST(HouseTest, PlatformLibrariesAndLibcurlAreNotLinked) {
+  std::string const dynamic = OutputOf("readelf -d " ZEP_LIBRARY);
+  EXPECT_NE(dynamic.find("libstdc++.so"), std::string::npos) << dynamic;
+  for (char const* name : {"libsmbios", "libipmiClient", "ovdusblan", "libcurl", "libfreeipmi"})
+    EXPECT_EQ(dynamic.find(name), std::string::npos) << name;
+  EXPECT_NE(dynamic.find("(RUNPATH)            Library runpath: [$ORIGIN]"), std::string::npos) << dynamic;
+}
+
+}  // namespace
+}  // namespace NQRVZEP20
