@@ -42,6 +42,7 @@ endif()
 function(zep_room name)
   add_library(${name} OBJECT ${ARGN})
   target_link_libraries(${name} PRIVATE zep_options)
+  target_compile_options(${name} PRIVATE -fno-semantic-interposition)  # exported functions may be inlined within the library
   target_include_directories(${name} PRIVATE ${PROJECT_SOURCE_DIR}/include ${PROJECT_SOURCE_DIR})
 endfunction()
 
