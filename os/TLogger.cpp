@@ -3,6 +3,7 @@
 #include "TCommUtil.h"
 #include "TOSSpecific.h"
 #include "TZEPException.h"
+#include "os/LocalTime.h"
 
 #include <boost/thread/lock_guard.hpp>
 #include <boost/thread/tss.hpp>
@@ -10,7 +11,9 @@
 #include <array>
 #include <atomic>
 #include <cerrno>
+#include <charconv>
 #include <cstdlib>
+#include <iterator>
 #include <memory>
 #include <string_view>
 
@@ -70,22 +73,44 @@ bool IsMemoryOnly(ILogger::EZEPLogSeverity severity) {
   return severity == ILogger::kLogMemoryOnly || severity == ILogger::kLogMemoryOnlyAlways;
 }
 
-// "3/3/2024  9:5:7 ", without zero fill. Each field is of a reading of its own: a line that is written across the turn of a
-// second may mix two times. Kept.
-std::string LocalTimeText() {
-  auto const second = std::to_string(TOSSpecific::GetLocalTime().GetSecond());
-  auto const minute = std::to_string(TOSSpecific::GetLocalTime().GetMinute());
-  auto const hour = std::to_string(TOSSpecific::GetLocalTime().GetHour());
-  auto const year = std::to_string(TOSSpecific::GetLocalTime().GetYear());
-  auto const day = std::to_string(TOSSpecific::GetLocalTime().GetDay());
-  auto const month = std::to_string(TOSSpecific::GetLocalTime().GetMonth());
-  return month + "/" + day + "/" + year + "  " + hour + ":" + minute + ":" + second + " ";
+// A text of a few pieces and numbers, built without an allocation.
+class TShortText {
+public:
+  TShortText& operator<<(std::string_view piece) {
+    fSize += piece.copy(fText + fSize, piece.size());
+    return *this;
+  }
+  TShortText& operator<<(int number) {
+    fSize = static_cast<std::size_t>(std::to_chars(fText + fSize, std::end(fText), number).ptr - fText);
+    return *this;
+  }
+  std::string_view View() const { return {fText, fSize}; }
+
+private:
+  char fText[128];  // the widest numbers leave it half empty
+  std::size_t fSize = 0;
+};
+
+// "FDR_[Status] 3/3/2024  9:5:7 ", without zero fill. Each field is of a reading of its own: a line that is written across
+// the turn of a second may mix two times. Kept.
+TShortText HeadOf(ILogger::EZEPLogSeverity severity) {
+  TLocalClock clock;  // that of GetLocalTime
+  int const second = clock.Now().fFields.tm_sec;
+  int const minute = clock.Now().fFields.tm_min;
+  int const hour = clock.Now().fFields.tm_hour;
+  int const year = clock.Now().fFields.tm_year + 1900;
+  int const day = clock.Now().fFields.tm_mday;
+  int const month = clock.Now().fFields.tm_mon + 1;
+  TShortText head;
+  head << "FDR_" << kLabels[severity] << month << "/" << day << "/" << year << "  " << hour << ":" << minute << ":" << second;
+  return head << " ";
 }
 
 std::string LineOf(ILogger::EZEPLogSeverity severity, std::string const& message) {
-  std::string line = "FDR_";
-  line.append(kLabels[severity]).append(LocalTimeText()).append(message).append("\n");
-  return line;
+  TShortText const head = HeadOf(severity);
+  std::string line;
+  line.reserve(head.View().size() + message.size() + 1);
+  return line.append(head.View()).append(message).append("\n");
 }
 
 void Record(ILogger::EZEPLogSeverity severity, std::string const& message) {

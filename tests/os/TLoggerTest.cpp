@@ -12,6 +12,7 @@
 #include <pthread.h>
 #include <boost/thread/thread.hpp>
 
+#include <chrono>
 #include <climits>
 #include <cstring>
 #include <ctime>
@@ -477,7 +478,7 @@ TEST_F(TLoggerTest, EachFieldOfTheTimeIsAReadingOfItsOwn) {
 
 // The time of the line as the C library tells it, in the zone of the process.
 std::string LocalTimeText() {
-  std::time_t const now = std::time(nullptr);
+  std::time_t const now = std::chrono::system_clock::to_time_t(std::chrono::system_clock::now());
   std::tm const fields = *std::localtime(&now);
   std::ostringstream text;
   text << fields.tm_mon + 1 << "/" << fields.tm_mday << "/" << fields.tm_year + 1900 << "  " << fields.tm_hour << ":"
