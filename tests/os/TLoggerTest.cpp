@@ -10,7 +10,6 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <pthread.h>
-#include <boost/thread/thread.hpp>
 
 #include <chrono>
 #include <climits>
@@ -193,18 +192,7 @@ TEST_F(TLoggerTest, AThreadLocalObjectMayLogAtTheEndOfAThread) {
   EXPECT_EQ(ReadFile(Path("a.log")), kOpenBanner + "FDR_[Status] 3/3/2024  9:5:7 the end\n" + kCloseBanner);
 }
 
-// These threads end what they own earlier: the logger, with its file, is gone when the object logs.
-TEST_F(TLoggerTest, AThreadLocalObjectThatOutlivesTheLoggerGetsANewOneWithoutAFile) {
-  boost::thread([this] {
-    thread_local TLogsAtTheEnd logsAtTheEnd;
-    logsAtTheEnd.Touch();
-    TLogger::GetInstance()->SetLogFilename(Path("a.log"));
-  }).join();
-  EXPECT_EQ(ReadFile(Path("a.log")), kOpenBanner + kCloseBanner);
-  EXPECT_THAT(LoggedMessages(), ElementsAre("the end"));
-}
-
-TEST_F(TLoggerTest, AThreadSpecificValueMayLogAtTheEndOfAThread) {
+TEST_F(TLoggerTest, WhatOutlivesTheLoggerOfAThreadGetsANewOneWithoutAFile) {
   TLogger::GetInstance();  // the logger's own key is made first, and so ends first
   pthread_key_t key;
   ASSERT_EQ(::pthread_key_create(&key, [](void*) { TLogsAtTheEnd(); }), 0);
