@@ -22,7 +22,8 @@ class TCIMReferenceImpl;
 // The namespace is held weakly: a reference never keeps one alive. Copies are deep and share only the class and the
 // resolved element. Keys can be added only once a class is set, and the class can be changed only while there are no
 // keys; what comes in the wrong order throws kZEPStatusInvalidOpSequence. Exceptions of the namespace pass through unless
-// said otherwise. Not synchronised.
+// said otherwise. A reference that was moved from can be assigned to or destroyed; any other use is a failed assertion.
+// Not synchronised.
 class ZEP_EXPORT TCIMReference {
 public:
   // An empty reference on that namespace. `context` is handed to the namespace whenever a class is looked up by name.
@@ -32,9 +33,9 @@ public:
   TCIMReference(boost::shared_ptr<ICIMNamespace> ns, std::string const& path, TCIMContext context);
 
   TCIMReference(TCIMReference const& other);
-  TCIMReference(TCIMReference&& other);
+  TCIMReference(TCIMReference&& other) noexcept;
   TCIMReference& operator=(TCIMReference const& other);
-  TCIMReference& operator=(TCIMReference&& other);
+  TCIMReference& operator=(TCIMReference&& other) noexcept;
   ~TCIMReference();
 
   // ---- Paths ----
@@ -45,7 +46,8 @@ public:
 
   // Reads a path into a reference that has a live namespace, no class and no keys. Keys are read only behind a namespace
   // prefix (`ns:X_Disk.Id="5"`), which is dropped; without one the whole text is a class name. Malformed paths, unknown
-  // classes and unknown keys are logged as errors and throw kZEPStatusInvalidReference; what was read before stays set.
+  // classes and unknown keys are logged as errors and throw kZEPStatusInvalidReference; what was read before stays set. A
+  // key that comes twice keeps its first value.
   void SetPath(std::string const& path);
 
   // ---- Parts ----
@@ -60,6 +62,9 @@ public:
   boost::shared_ptr<ICIMClass> GetClass() const;  // empty until set
   void SetClass(boost::shared_ptr<ICIMClass> cls);
   std::string GetClassName() const;  // a reference without class is a failed assertion
+
+  // Sets the class that the namespace knows by that name. Throws boost::bad_weak_ptr when the namespace is gone, and
+  // kZEPStatusNotFound, as the namespace does, when there is no such class.
   void SetClassName(std::string const& name);
 
   // Binds a key. Throws kZEPStatusTypeMismatch, after an error in the log, when the value's type is not the declared one,
@@ -88,6 +93,9 @@ public:
   TCIMReferenceImpl* GetBody() const { return fBody.get(); }  // owned by this reference
 
 private:
+  TCIMReferenceImpl& Body() const;
+  void BindBody() noexcept;  // tells the body whose it is now
+
   std::unique_ptr<TCIMReferenceImpl> fBody;  // null only in a reference that was moved from
 };
 

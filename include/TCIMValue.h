@@ -30,7 +30,7 @@ public:
   // The type tag: a CIM intrinsic type, and whether it is an array of that type.
   class ZEP_EXPORT TCIMType {
   public:
-    enum ECIMType {
+    enum ECIMType : int {
       kCIMTypeInvalid = 0,  // the tag of a default-constructed value
       kCIMTypeBoolean = 1,
       kCIMTypeUint8 = 2,
@@ -194,6 +194,12 @@ public:
   bool operator>(TCIMValue const& other) const { return !(*this == other) && !(*this < other); }
 
 private:
+  friend class TCIMValueImpl;
+
+  TCIMValueImpl const& Data(TCIMType required) const;
+  void SetData(TCIMType type, std::unique_ptr<TCIMValueImpl> data);
+  void TakeFrom(TCIMValue& other) noexcept;
+
   TCIMType fType;
   std::unique_ptr<TCIMValueImpl> fImpl;  // null means the value is NULL; never shared
   boost::shared_ptr<ICIMClass> fReferencedClass;

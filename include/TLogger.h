@@ -17,7 +17,8 @@ namespace NQRVZEP20 {
 // not, and are meant to be set during start-up. Every operation blocks for the file system.
 class ZEP_EXPORT TLogger : public ILogger {
 public:
-  // The calling thread's logger, made on its first call. Never null; owned by the thread.
+  // The calling thread's logger, made on its first call. Never null; owned by the thread. A thread that calls this after its
+  // logger was destroyed (from the destructor of a thread-local or static object) gets a new one, which has no file.
   static TLogger* GetInstance();
 
   // ---- Shared by all threads ----
@@ -36,6 +37,8 @@ public:
   // ---- This thread's log file ----
 
   TLogger();
+  TLogger(TLogger const&) = delete;
+  TLogger& operator=(TLogger const&) = delete;
 
   // Writes the closing banner and closes the file, if one is open.
   ~TLogger() override;
@@ -47,8 +50,8 @@ public:
 
   // Opens the file and writes the opening banner. An existing file is truncated, unless the environment variable
   // QRV_YBNQI_GUI_T is set (to anything), which appends. Throws kZEPStatusAccessDenied for EACCES and
-  // kZEPStatusFileSystemError for any other failure; the name stays set then. A stream opened by an earlier call stays
-  // open, unused.
+  // kZEPStatusFileSystemError for any other failure; the name stays set then, and nothing is written until a later call
+  // succeeds. A stream opened by an earlier call stays open, unused.
   void SetLogFilename(std::string path) override;
 
   // ---- Writing ----

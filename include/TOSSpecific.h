@@ -20,8 +20,6 @@ class ZEP_EXPORT TOSSpecific {
 public:
   // ---- Files, directories, paths and environment (TOSSpecificFiles.cpp) ----
 
-  static std::string const kFileSeparator;  // "/"
-
   // False for a directory and for what is not there; devices, pipes and sockets count as files. Links are followed.
   static bool FileExists(std::string path);
   static bool DirExists(std::string path);
@@ -59,6 +57,7 @@ public:
   // the core library; collection plug-ins ("pi") one level below a plug-in root. Nothing is remembered between calls, and
   // a loaded library is never unloaded.
 
+  static std::string const kFileSeparator;           // "/"
   static std::string const kDynamicModuleExtension;  // ".so"
   static std::string const kZEPPluginExtension;      // "pi"
   static std::string const kPluginExtension;         // ".pi.so"
@@ -67,7 +66,7 @@ public:
   static std::string const libx86IntrAddrFile;       // "/tmp/intr_address.tmp"
 
   // The directory that holds the loaded core library, without a trailing separator. Throws kZEPStatusFileSystemError when
-  // the dynamic linker does not know it.
+  // the dynamic linker does not know it, or names the library with more than 511 bytes.
   static std::string GetZEPRootPath();
 
   // The full paths of the plug-ins of that kind in the subdirectories of `root`, in byte order. A name counts when it
@@ -76,8 +75,8 @@ public:
   static std::vector<std::string> FindPlugins(std::string root);  // of the kind "pi"
 
   // The base names of the libraries of that kind in the root path, in directory order: every non-directory whose name
-  // holds ".<kind>", less its first three and last seven characters, whatever these are. Throws
-  // kZEPStatusFileSystemError when the root path cannot be opened.
+  // holds ".<kind>", less its first three and last seven characters, whatever these are (a shorter name gives an empty
+  // base name). Throws kZEPStatusFileSystemError when the root path cannot be opened.
   static std::vector<std::string> FindNSServices(std::string kind);
   static std::vector<std::string> FindNSPs();  // of the kind "nsp"
   static std::vector<std::string> FindNSCs();  // of the kind "nsc"
@@ -98,7 +97,8 @@ public:
   static void LoadNSPLibrary(std::string baseName);
 
   // Loads "<root path>/lib<baseName>.nsc.so" and makes the consumer with its function <baseName>_CreateINamespaceConsumer;
-  // the caller owns it. Fails as above; a missing function is logged as an error and throws kZEPStatusNotFound.
+  // the caller owns it. Fails as above; a missing function is logged as an error and throws kZEPStatusNotFound, and the
+  // library stays loaded.
   static INamespaceConsumer* LoadNSCLibrary(std::string baseName);
 
   // ---- Machine identification (TOSSpecificMachine.cpp) ----

@@ -1,0 +1,229 @@
+#include "TCIMReferenceImpl.h"
+
+#include "ICIMClass.h"
+#include "ICIMInstance.h"
+#include "ICIMNamespace.h"
+#include "ICIMPropertyDecl.h"
+#include "TZEPException.h"
+#include "core/Log.h"
+
+#include <algorithm>
+#include <sstream>
+#include <string_view>
+
+namespace NQRVZEP20 {
+namespace {
+
+constexpr std::size_t kNowhere = std::string::npos;
+
+[[noreturn]] void ThrowInvalidReference(std::string_view reason, std::string const& path) {
+  LogError(reason, path);
+  throw TZEPException(kZEPStatusInvalidReference);
+}
+
+// The "." between class and keys. Only one behind a ":" counts, so that without a namespace prefix a path has no keys. Kept.
+std::size_t FindEndOfClass(std::string const& path, std::size_t pos) {
+  std::size_t const colon = path.find(':', pos);
+  return colon == kNowhere ? kNowhere : path.find('.', colon);
+}
+
+bool IsEndOfKeys(std::string const& path, std::size_t pos, bool isNested) {
+  return pos >= path.size() || (isNested && path[pos] == '"');
+}
+
+// Reads a quoted text; `pos` goes from its opening to its closing quote. A backslash before anything but a quote or a
+// backslash is kept, with what follows it.
+std::string ReadQuotedText(std::string const& path, std::size_t& pos) {
+  std::string text;
+  for (++pos; pos < path.size() && path[pos] != '"'; ++pos) {
+    if (path[pos] == '\\') {
+      if (++pos == path.size()) break;
+      if (path[pos] != '"' && path[pos] != '\\') text += '\\';
+    }
+    text += path[pos];
+  }
+  if (pos >= path.size()) ThrowInvalidReference("Reference missing closing '\"', path=", path);
+  return text;
+}
+
+void AppendEscaped(std::string& path, std::string_view text) {
+  for (char const c : text) {
+    if (c == '"' || c == '\\') path += '\\';
+    path += c;
+  }
+}
+
+// A plug-in reports an unknown property in either of two ways, by kZEPStatusNotFound or by an empty pointer. Both throw
+// kZEPStatusNotFound here.
+boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(ICIMClass const& cls, std::string const& name) {
+  auto declaration = cls.GetPropertyDecl(name, TCIMContext());
+  if (!declaration) throw TZEPException(kZEPStatusNotFound);
+  return declaration;
+}
+
+std::string TypeMismatchText(TCIMValue::TCIMType declared, TCIMValue::TCIMType given) {
+  std::ostringstream text;
+  text << "Core: Declaration type: " << declared << " Value type: " << given;
+  return text.str();
+}
+
+}  // namespace
+
+TCIMReferenceImpl::TCIMReferenceImpl(TCIMReference& owner, boost::shared_ptr<ICIMNamespace> ns, TCIMContext context)
+    : fOwner(owner), fNamespace(ns), fContext(std::move(context)) {}
+
+TCIMReferenceImpl::TCIMReferenceImpl(TCIMReference& owner, TCIMReferenceImpl const& other)
+    : fOwner(owner),
+      fNamespace(other.fNamespace),
+      fContext(other.fContext),
+      fClass(other.fClass),
+      fKeys(other.fKeys),
+      fElement(other.fElement),
+      fNamespaceName(other.fNamespaceName) {}
+
+TCIMReferenceImpl::~TCIMReferenceImpl() = default;
+
+// ---- Printing ----
+
+std::string TCIMReferenceImpl::GetPath() const {
+  std::string path = GetClassName();
+  if (fKeys.empty()) return path;
+  path += '.';
+  for (auto const& [name, value] : fKeys) {
+    path += name;
+    path += "=\"";
+    if (value.IsReference())
+      path += value.ToString(10);  // raw, quotes and all. Kept.
+    else
+      AppendEscaped(path, value.ToString(10));
+    path += "\",";
+  }
+  path.pop_back();
+  return path;
+}
+
+// ---- Parsing ----
+
+void TCIMReferenceImpl::SetPath(std::string const& path) {
+  auto const ns = fNamespace.lock();  // held until the path is read
+  if (!ns || fClass || !fKeys.empty()) throw TZEPException(kZEPStatusInvalidOpSequence);
+  std::size_t pos = 0;
+  ParsePath(*this, path, pos);
+}
+
+void TCIMReferenceImpl::ParsePath(TCIMReferenceImpl& target, std::string const& path, std::size_t& pos) {
+  bool const isNested = pos != 0;
+  if (isNested) ++pos;  // the opening quote
+
+  std::size_t const end = std::min(FindEndOfClass(path, pos), path.size());
+  target.ReadClass(path, pos, end);
+  pos = end;
+  while (!IsEndOfKeys(path, pos, isNested)) pos = target.ReadKeyBinding(path, pos);
+}
+
+void TCIMReferenceImpl::ReadClass(std::string const& path, std::size_t begin, std::size_t end) {
+  std::size_t const colon = path.find(':', begin);
+  if (colon < end) begin = colon + 1;
+  try {
+    SetClassName(path.substr(begin, end - begin));
+  } catch (TZEPException const& failure) {
+    if (failure.GetStatusCode() != kZEPStatusNotFound) throw;
+    ThrowInvalidReference("Reference specifies invalid class, path=", path);
+  }
+}
+
+// Reads `,name="value"` and returns the position behind it.
+std::size_t TCIMReferenceImpl::ReadKeyBinding(std::string const& path, std::size_t pos) {
+  if (path[pos] != ',' && path[pos] != '.') ThrowInvalidReference("Reference missing '.' or ',', path=", path);
+  std::size_t const equals = path.find('=', pos);
+  if (equals == kNowhere) ThrowInvalidReference("Reference missing property value, path=", path);
+  std::string name = path.substr(pos + 1, equals - pos - 1);
+  auto const declaration = ReadDeclaration(path, name);
+  pos = equals + 1;
+  if (pos == path.size() || path[pos] != '"') ThrowInvalidReference("Reference missing opening '\"', path=", path);
+
+  bool const isReference = declaration->GetDefaultValue(TCIMContext()).IsReference();
+  TCIMValue value = isReference ? ReadReference(path, pos) : ReadValue(*declaration, path, pos);
+  fKeys.emplace(std::move(name), std::move(value));  // the first binding of a name stays. Kept.
+  return std::min(pos + 1, path.size());
+}
+
+boost::shared_ptr<ICIMPropertyDecl const> TCIMReferenceImpl::ReadDeclaration(std::string const& path,
+                                                                             std::string const& name) const {
+  try {
+    return GetDeclaration(*fClass, name);
+  } catch (TZEPException const& failure) {
+    if (failure.GetStatusCode() != kZEPStatusNotFound) throw;
+    ThrowInvalidReference("Reference specifies invalid property, property=" + name + ", path=", path);
+  }
+}
+
+// Reads a path between quotes, which are not escaped inside it; `pos` goes from the opening to the closing quote.
+TCIMValue TCIMReferenceImpl::ReadReference(std::string const& path, std::size_t& pos) const {
+  TCIMReference reference(GetNamespace(), fContext);
+  ParsePath(*reference.GetBody(), path, pos);
+  return TCIMValue(reference);
+}
+
+TCIMValue TCIMReferenceImpl::ReadValue(ICIMPropertyDecl const& declaration, std::string const& path, std::size_t& pos) const {
+  std::string text = ReadQuotedText(path, pos);
+  return TCIMValue(declaration.GetType(TCIMContext()), text, GetNamespace());
+}
+
+// ---- Parts ----
+
+void TCIMReferenceImpl::SetClass(boost::shared_ptr<ICIMClass> cls) {
+  if (!fKeys.empty()) throw TZEPException(kZEPStatusInvalidOpSequence);
+  fClass = std::move(cls);
+}
+
+std::string TCIMReferenceImpl::GetClassName() const { return fClass->GetName(TCIMContext()); }
+
+void TCIMReferenceImpl::SetClassName(std::string const& name) {
+  boost::shared_ptr<ICIMNamespace> const ns(fNamespace);  // throws boost::bad_weak_ptr when it is gone
+  SetClass(ns->GetClass(name, TCIMContext(fContext)));
+}
+
+void TCIMReferenceImpl::AddKeyValue(std::string const& name, TCIMValue const& value) {
+  if (!fClass) throw TZEPException(kZEPStatusInvalidOpSequence);
+  TCIMValue::TCIMType const declared = GetDeclaration(*fClass, name)->GetType(TCIMContext());
+  if (declared != value.GetType()) {
+    LogError(TypeMismatchText(declared, value.GetType()));
+    throw TZEPException(kZEPStatusTypeMismatch);
+  }
+  fKeys.emplace(name, value);  // the first binding of a name stays. Kept.
+}
+
+void TCIMReferenceImpl::EnumerateKeyBindings(boost::function<bool(std::pair<std::string, TCIMValue>)> callback) const {
+  for (auto const& key : fKeys)
+    if (!callback(key)) return;
+}
+
+void TCIMReferenceImpl::Clear() {
+  fNamespace.reset();
+  fClass.reset();
+  fKeys.clear();
+  fElement.reset();
+}
+
+// ---- Resolving ----
+
+boost::shared_ptr<ICIMElement> TCIMReferenceImpl::GetCIMElement(bool classOnly) {
+  if (classOnly || fKeys.empty()) return fClass;
+  if (!fElement) fElement = fClass->GetNamespace(TCIMContext())->GetInstance(fOwner, TCIMContext());
+  if (!fElement) throw TZEPException(kZEPStatusNotFound);
+  return fElement;
+}
+
+// ---- Comparison ----
+
+bool TCIMReferenceImpl::operator==(TCIMReferenceImpl const& other) const {
+  return fClass == other.fClass && fKeys == other.fKeys;
+}
+
+bool TCIMReferenceImpl::operator<(TCIMReferenceImpl const& other) const {
+  if (fClass == other.fClass) return fKeys < other.fKeys;
+  return fClass.owner_before(other.fClass);
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,154 @@
+#include "cim/value/NumberText.h"
+
+#include "TZEPException.h"
+
+#include <charconv>
+#include <limits>
+#include <locale>
+#include <sstream>
+#include <type_traits>
+
+namespace NQRVZEP20 {
+namespace {
+
+constexpr std::size_t kLongestText = 24;  // a uint64 in base 8 has 22 digits
+
+// What std::to_chars writes into a buffer, as a string.
+template <class... TArguments>
+std::string ToChars(TArguments... arguments) {
+  char buffer[kLongestText];
+  char* const end = std::to_chars(buffer, buffer + sizeof buffer, arguments...).ptr;
+  return std::string(buffer, end);
+}
+
+std::string HexText(unsigned long number, std::size_t width) {
+  std::string text(width, '0');
+  for (auto digit = text.rbegin(); digit != text.rend(); ++digit, number >>= 4) *digit = "0123456789ABCDEF"[number & 0xF];
+  return text;
+}
+
+void RequireDecimal(unsigned char radix) {
+  if (radix != 10) throw TZEPException(kZEPStatusNotSupported);
+}
+
+bool IsBlank(char c) { return c == ' ' || (c >= '\t' && c <= '\r'); }
+bool IsDigit(char c) { return c >= '0' && c <= '9'; }
+
+std::string_view WithoutLeadingBlanks(std::string_view text) {
+  std::size_t blanks = 0;
+  while (blanks < text.size() && IsBlank(text[blanks])) ++blanks;
+  return text.substr(blanks);
+}
+
+// Takes a leading sign off the text and tells whether it was a minus.
+bool TakeSign(std::string_view& text) {
+  if (text.empty() || (text[0] != '+' && text[0] != '-')) return false;
+  bool const negative = text[0] == '-';
+  text.remove_prefix(1);
+  return negative;
+}
+
+template <class TInteger>
+TInteger ReadInteger(std::string_view text) {
+  text = WithoutLeadingBlanks(text);
+  bool const negative = TakeSign(text);
+
+  std::make_unsigned_t<TInteger> magnitude = 0;
+  if (std::from_chars(text.data(), text.data() + text.size(), magnitude).ec != std::errc()) return 0;
+  if (std::is_signed_v<TInteger> && magnitude > static_cast<unsigned long>(std::numeric_limits<TInteger>::max()) + negative)
+    return 0;
+  return static_cast<TInteger>(negative ? 0 - magnitude : magnitude);
+}
+
+// The characters that can make up a real, one after the other: digits, a point, an exponent with its sign. What is taken
+// need not be a number: "." and "1e" are taken whole.
+std::string_view TakeReal(std::string_view text) {
+  bool hasDigits = false, hasPoint = false, hasExponent = false;
+  std::size_t i = 0;
+  for (; i < text.size(); ++i) {
+    if (IsDigit(text[i])) {
+      hasDigits = true;
+    } else if (text[i] == '.' && !hasPoint && !hasExponent) {
+      hasPoint = true;
+    } else if ((text[i] == 'e' || text[i] == 'E') && hasDigits && !hasExponent) {
+      hasExponent = true;
+      if (i + 1 < text.size() && (text[i + 1] == '+' || text[i + 1] == '-')) ++i;
+    } else {
+      break;
+    }
+  }
+  return text.substr(0, i);
+}
+
+// A real that is too large or too small for its type. std::from_chars does not say which; a stream does: the one is a
+// failure, the other a zero with its sign.
+template <class TReal>
+TReal ReadExtremeReal(std::string_view text) {
+  std::istringstream stream{std::string(text)};
+  stream.imbue(std::locale::classic());
+  TReal number = 0;
+  return stream >> number ? number : 0;
+}
+
+template <class TReal>
+TReal ReadReal(std::string_view text) {
+  std::string_view digits = WithoutLeadingBlanks(text);
+  bool const negative = TakeSign(digits);
+  digits = TakeReal(digits);
+
+  TReal magnitude = 0;
+  char const* const end = digits.data() + digits.size();
+  auto const read = std::from_chars(digits.data(), end, magnitude);
+  if (read.ec == std::errc::invalid_argument || read.ptr != end) return 0;
+  if (read.ec == std::errc::result_out_of_range) return ReadExtremeReal<TReal>(text);
+  return negative ? -magnitude : magnitude;
+}
+
+bool ReadBoolean(std::string_view text) { return WithoutLeadingBlanks(text).substr(0, 4) == "true"; }
+
+}  // namespace
+
+template <class TNumber>
+std::string TextOf(TNumber number, unsigned char radix) {
+  if constexpr (std::is_same_v<TNumber, bool>) {
+    return number ? "true" : "false";
+  } else if constexpr (std::is_floating_point_v<TNumber>) {
+    RequireDecimal(radix);
+    return ToChars(static_cast<double>(number), std::chars_format::general, 6);
+  } else if constexpr (std::is_signed_v<TNumber>) {
+    RequireDecimal(radix);
+    return ToChars(number);
+  } else {
+    return radix == 16 ? HexText(number, 2 * sizeof number) : ToChars(number, radix);
+  }
+}
+
+template <class TNumber>
+TNumber ReadNumber(std::string_view text) {
+  if constexpr (std::is_same_v<TNumber, bool>)
+    return ReadBoolean(text);
+  else if constexpr (std::is_floating_point_v<TNumber>)
+    return ReadReal<TNumber>(text);
+  else
+    return ReadInteger<TNumber>(text);
+}
+
+#define ZEP_NUMBER_TEXT(TNumber)                          \
+  template std::string TextOf(TNumber, unsigned char);    \
+  template TNumber ReadNumber<TNumber>(std::string_view);
+
+ZEP_NUMBER_TEXT(bool)
+ZEP_NUMBER_TEXT(unsigned char)
+ZEP_NUMBER_TEXT(signed char)
+ZEP_NUMBER_TEXT(unsigned short)
+ZEP_NUMBER_TEXT(short)
+ZEP_NUMBER_TEXT(unsigned int)
+ZEP_NUMBER_TEXT(int)
+ZEP_NUMBER_TEXT(unsigned long)
+ZEP_NUMBER_TEXT(long)
+ZEP_NUMBER_TEXT(float)
+ZEP_NUMBER_TEXT(double)
+
+#undef ZEP_NUMBER_TEXT
+
+}  // namespace NQRVZEP20

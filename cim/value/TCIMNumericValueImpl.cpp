@@ -1,0 +1,123 @@
+#include "TCIMNumericValueImpl.h"
+
+#include "cim/value/NumberText.h"
+#include "cim/value/ScalarTypes.h"
+
+#include <type_traits>
+
+namespace NQRVZEP20 {
+
+using TType = TCIMValue::TCIMType;
+
+namespace {
+
+// The stored number, read without a virtual call.
+template <class TNumber, class TData>
+TNumber Stored(TData const& data) {
+  return data.TData::operator TNumber();
+}
+
+// Calls `function` with the stored number.
+template <class TResult, class TFunction>
+TResult OnNumber(TType type, TCIMNumericValueImpl const& data, TFunction const& function) {
+  return OnScalarType(type, [&](auto scalar) -> TResult {
+    using TStorage = typename decltype(scalar)::TStorage;
+    if constexpr (std::is_arithmetic_v<TStorage>) return function(Stored<TStorage>(data));
+    throw TZEPException(std::is_same_v<TStorage, TCIMChar16> ? kZEPStatusNotImplemented : kZEPStatusTypeMismatch);
+  });
+}
+
+void Require(bool sameType) {
+  if (!sameType) throw TZEPException(kZEPStatusTypeMismatch);
+}
+
+}  // namespace
+
+TCIMNumericValueImpl::TCIMNumericValueImpl(bool value) noexcept : fType(TType::kCIMTypeBoolean), fBoolean(value) {}
+TCIMNumericValueImpl::TCIMNumericValueImpl(unsigned char value) noexcept : fType(TType::kCIMTypeUint8), fUint8(value) {}
+TCIMNumericValueImpl::TCIMNumericValueImpl(signed char value) noexcept : fType(TType::kCIMTypeSint8), fSint8(value) {}
+TCIMNumericValueImpl::TCIMNumericValueImpl(unsigned short value) noexcept : fType(TType::kCIMTypeUint16), fUint16(value) {}
+TCIMNumericValueImpl::TCIMNumericValueImpl(short value) noexcept : fType(TType::kCIMTypeSint16), fSint16(value) {}
+TCIMNumericValueImpl::TCIMNumericValueImpl(unsigned int value) noexcept : fType(TType::kCIMTypeUint32), fUint32(value) {}
+TCIMNumericValueImpl::TCIMNumericValueImpl(int value) noexcept : fType(TType::kCIMTypeSint32), fSint32(value) {}
+TCIMNumericValueImpl::TCIMNumericValueImpl(unsigned long value) noexcept : fType(TType::kCIMTypeUint64), fUint64(value) {}
+TCIMNumericValueImpl::TCIMNumericValueImpl(long value) noexcept : fType(TType::kCIMTypeSint64), fSint64(value) {}
+TCIMNumericValueImpl::TCIMNumericValueImpl(float value) noexcept : fType(TType::kCIMTypeReal32), fReal32(value) {}
+TCIMNumericValueImpl::TCIMNumericValueImpl(double value) noexcept : fType(TType::kCIMTypeReal64), fReal64(value) {}
+TCIMNumericValueImpl::TCIMNumericValueImpl(TCIMNumericValueImpl const& other) = default;
+TCIMNumericValueImpl::~TCIMNumericValueImpl() = default;
+
+TCIMNumericValueImpl::operator bool() const {
+  Require(fType == TType::kCIMTypeBoolean);
+  return fBoolean;
+}
+
+TCIMNumericValueImpl::operator unsigned char() const {
+  Require(fType == TType::kCIMTypeUint8);
+  return fUint8;
+}
+
+TCIMNumericValueImpl::operator signed char() const {
+  Require(fType == TType::kCIMTypeSint8);
+  return fSint8;
+}
+
+TCIMNumericValueImpl::operator unsigned short() const {
+  Require(fType == TType::kCIMTypeUint16);
+  return fUint16;
+}
+
+TCIMNumericValueImpl::operator short() const {
+  Require(fType == TType::kCIMTypeSint16);
+  return fSint16;
+}
+
+TCIMNumericValueImpl::operator unsigned int() const {
+  Require(fType == TType::kCIMTypeUint32);
+  return fUint32;
+}
+
+TCIMNumericValueImpl::operator int() const {
+  Require(fType == TType::kCIMTypeSint32);
+  return fSint32;
+}
+
+TCIMNumericValueImpl::operator unsigned long() const {
+  Require(fType == TType::kCIMTypeUint64);
+  return fUint64;
+}
+
+TCIMNumericValueImpl::operator long() const {
+  Require(fType == TType::kCIMTypeSint64);
+  return fSint64;
+}
+
+TCIMNumericValueImpl::operator float() const {
+  Require(fType == TType::kCIMTypeReal32);
+  return fReal32;
+}
+
+TCIMNumericValueImpl::operator double() const {
+  Require(fType == TType::kCIMTypeReal64);
+  return fReal64;
+}
+
+
+std::string TCIMNumericValueImpl::ToString(unsigned char radix) const {
+  if (radix != 10 && radix != 16 && radix != 8) throw TZEPException(kZEPStatusNotSupported);
+  return OnNumber<std::string>(fType, *this, [&](auto number) { return TextOf(number, radix); });
+}
+
+bool TCIMNumericValueImpl::operator==(TCIMValue const& other) const {
+  if (other.GetType() != fType) return false;
+  auto const& theirs = DataOf<TCIMNumericValueImpl>(other);
+  return OnNumber<bool>(fType, *this, [&](auto mine) { return mine == Stored<decltype(mine)>(theirs); });
+}
+
+bool TCIMNumericValueImpl::operator<(TCIMValue const& other) const {
+  if (other.GetType() != fType) return false;
+  auto const& theirs = DataOf<TCIMNumericValueImpl>(other);
+  return OnNumber<bool>(fType, *this, [&](auto mine) { return Stored<decltype(mine)>(theirs) > mine; });
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,24 @@
+#include "TCIMStringValueImpl.h"
+
+namespace NQRVZEP20 {
+
+TCIMStringValueImpl::TCIMStringValueImpl(std::string const& text) : fText(text) {}
+TCIMStringValueImpl::TCIMStringValueImpl(char const* text) : fText(text) {}
+TCIMStringValueImpl::TCIMStringValueImpl(TCIMStringValueImpl const& other) = default;
+TCIMStringValueImpl::~TCIMStringValueImpl() = default;
+
+TCIMStringValueImpl::operator std::string() const { return fText; }
+
+std::string TCIMStringValueImpl::ToString(unsigned char) const { return fText; }
+
+bool TCIMStringValueImpl::operator==(TCIMValue const& other) const {
+  if (other.GetType() != TCIMValue::TCIMType::kCIMTypeString) return false;
+  return fText == DataOf<TCIMStringValueImpl>(other).fText;
+}
+
+bool TCIMStringValueImpl::operator<(TCIMValue const& other) const {
+  if (other.GetType() != TCIMValue::TCIMType::kCIMTypeString) return false;
+  return fText < DataOf<TCIMStringValueImpl>(other).fText;
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,27 @@
+#pragma once
+
+#include "TCIMDateTime.h"
+#include "TCIMValueImpl.h"
+
+namespace NQRVZEP20 {
+
+// The datetime kind of a TCIMValue's data.
+class ZEP_EXPORT TCIMDateTimeValueImpl : public TCIMValueImpl {
+public:
+  explicit TCIMDateTimeValueImpl(TCIMDateTime const& dateTime);
+  TCIMDateTimeValueImpl(TCIMDateTimeValueImpl const& other);
+  ~TCIMDateTimeValueImpl() override;
+
+  operator TCIMDateTime() const override;
+
+  // The CIM text, whatever the radix. Throws kZEPStatusInvalidDateTime for a NULL datetime, as the comparisons do.
+  std::string ToString(unsigned char radix) const override;
+
+  bool operator==(TCIMValue const& other) const override;
+  bool operator<(TCIMValue const& other) const override;
+
+private:
+  TCIMDateTime const fDateTime;
+};
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,65 @@
+#pragma once
+
+#include "TCIMValueImpl.h"
+
+namespace NQRVZEP20 {
+
+// A boolean, an integer or a real. It is read only as exactly the type it is stored as: any other conversion throws
+// kZEPStatusTypeMismatch.
+class ZEP_EXPORT TCIMNumericValueImpl : public TCIMValueImpl {
+public:
+  explicit TCIMNumericValueImpl(bool value) noexcept;
+  explicit TCIMNumericValueImpl(unsigned char value) noexcept;
+  explicit TCIMNumericValueImpl(signed char value) noexcept;
+  explicit TCIMNumericValueImpl(unsigned short value) noexcept;
+  explicit TCIMNumericValueImpl(short value) noexcept;
+  explicit TCIMNumericValueImpl(unsigned int value) noexcept;
+  explicit TCIMNumericValueImpl(int value) noexcept;
+  explicit TCIMNumericValueImpl(unsigned long value) noexcept;
+  explicit TCIMNumericValueImpl(long value) noexcept;
+  explicit TCIMNumericValueImpl(float value) noexcept;
+  explicit TCIMNumericValueImpl(double value) noexcept;
+  TCIMNumericValueImpl(TCIMNumericValueImpl const& other);
+  ~TCIMNumericValueImpl() override;
+
+  operator bool() const override;
+  operator unsigned char() const override;
+  operator signed char() const override;
+  operator unsigned short() const override;
+  operator short() const override;
+  operator unsigned int() const override;
+  operator int() const override;
+  operator unsigned long() const override;
+  operator long() const override;
+  operator float() const override;
+  operator double() const override;
+
+  // `radix` is 10, 16 or 8; anything else throws kZEPStatusNotSupported, for a boolean too. Unsigned integers print in each,
+  // in base 16 with capitals and zeros up to the width of the type, in base 8 without padding. Signed integers and reals
+  // print in decimal only and otherwise throw kZEPStatusNotSupported. A boolean is "true" or "false". A real has six
+  // significant digits, fixed or with an exponent, whichever is shorter, and a point whatever the process's locale is.
+  std::string ToString(unsigned char radix) const override;
+
+  // No comparison across types: uint8 5 and uint16 5 are neither equal nor ordered. A NaN equals nothing, not even itself,
+  // and nothing is less or greater.
+  bool operator==(TCIMValue const& other) const override;
+  bool operator<(TCIMValue const& other) const override;
+
+protected:
+  TCIMValue::TCIMType fType;  // kCIMTypeBoolean to kCIMTypeReal64
+  union {                     // the member of that type
+    bool fBoolean;
+    unsigned char fUint8;
+    signed char fSint8;
+    unsigned short fUint16;
+    short fSint16;
+    unsigned int fUint32;
+    int fSint32;
+    unsigned long fUint64;
+    long fSint64;
+    float fReal32;
+    double fReal64;
+  };
+};
+
+}  // namespace NQRVZEP20

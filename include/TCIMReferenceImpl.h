@@ -1,0 +1,70 @@
+#pragma once
+
+#include "TCIMReference.h"
+
+#include <boost/weak_ptr.hpp>
+
+#include <cstddef>
+#include <functional>
+
+namespace NQRVZEP20 {
+
+class ICIMPropertyDecl;
+
+// The body of a TCIMReference: its fields and its rules. TCIMReference says what each operation does; it forwards them all.
+class ZEP_EXPORT TCIMReferenceImpl {
+public:
+  TCIMReferenceImpl(TCIMReference& owner, boost::shared_ptr<ICIMNamespace> ns, TCIMContext context);
+  TCIMReferenceImpl(TCIMReference& owner, TCIMReferenceImpl const& other);  // a copy that belongs to `owner`
+  ~TCIMReferenceImpl();
+  TCIMReferenceImpl(TCIMReferenceImpl const&) = delete;
+  TCIMReferenceImpl& operator=(TCIMReferenceImpl const&) = delete;
+
+  void SetOwner(TCIMReference& owner) noexcept { fOwner = owner; }
+
+  // Reads the path into `target` from `pos` on, which comes back behind what was read. A `pos` other than 0 stands on the
+  // opening quote of a reference that is a key's value in an enclosing path: reading then ends on the closing quote, or at
+  // the end of the path, where a missing quote is not noticed.
+  static void ParsePath(TCIMReferenceImpl& target, std::string const& path, std::size_t& pos);
+
+  std::string GetPath() const;
+  void SetPath(std::string const& path);
+
+  boost::shared_ptr<ICIMNamespace> GetNamespace() const { return fNamespace.lock(); }
+  void SetNamespace(boost::shared_ptr<ICIMNamespace> ns) { fNamespace = ns; }
+  std::string GetNameSpaceName() const { return fNamespaceName; }
+  void SetNameSpaceName(std::string name) { fNamespaceName = std::move(name); }
+
+  boost::shared_ptr<ICIMClass> GetClass() const { return fClass; }
+  void SetClass(boost::shared_ptr<ICIMClass> cls);
+  std::string GetClassName() const;
+  void SetClassName(std::string const& name);
+
+  void AddKeyValue(std::string const& name, TCIMValue const& value);
+  void EnumerateKeyBindings(boost::function<bool(std::pair<std::string, TCIMValue>)> callback) const;
+
+  void SetContext(TCIMContext context) { fContext = std::move(context); }
+  void Clear();
+
+  boost::shared_ptr<ICIMElement> GetCIMElement(bool classOnly);
+
+  bool operator==(TCIMReferenceImpl const& other) const;
+  bool operator<(TCIMReferenceImpl const& other) const;
+
+private:
+  void ReadClass(std::string const& path, std::size_t begin, std::size_t end);
+  std::size_t ReadKeyBinding(std::string const& path, std::size_t pos);
+  boost::shared_ptr<ICIMPropertyDecl const> ReadDeclaration(std::string const& path, std::string const& name) const;
+  TCIMValue ReadReference(std::string const& path, std::size_t& pos) const;
+  TCIMValue ReadValue(ICIMPropertyDecl const& declaration, std::string const& path, std::size_t& pos) const;
+
+  std::reference_wrapper<TCIMReference> fOwner;  // handed to the namespace when the instance is looked up
+  boost::weak_ptr<ICIMNamespace> fNamespace;
+  TCIMContext fContext;                     // handed to the namespace when a class is looked up
+  boost::shared_ptr<ICIMClass> fClass;      // empty until set; not changed while there are keys
+  std::map<std::string, TCIMValue> fKeys;   // by name, in byte order
+  boost::shared_ptr<ICIMElement> fElement;  // the instance, once found; never looked up again
+  std::string fNamespaceName;               // the caller's label; has nothing to do with fNamespace
+};
+
+}  // namespace NQRVZEP20

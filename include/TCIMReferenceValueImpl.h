@@ -1,0 +1,28 @@
+#pragma once
+
+#include "TCIMReference.h"
+#include "TCIMValueImpl.h"
+
+namespace NQRVZEP20 {
+
+// An object path.
+class ZEP_EXPORT TCIMReferenceValueImpl : public TCIMValueImpl {
+public:
+  explicit TCIMReferenceValueImpl(TCIMReference const& reference);
+  TCIMReferenceValueImpl(TCIMReferenceValueImpl const& other);
+  ~TCIMReferenceValueImpl() override;
+
+  operator TCIMReference() const override;
+
+  // The path, whatever the radix.
+  std::string ToString(unsigned char radix) const override;
+
+  // As TCIMReference compares.
+  bool operator==(TCIMValue const& other) const override;
+  bool operator<(TCIMValue const& other) const override;
+
+private:
+  TCIMReference const fReference;
+};
+
+}  // namespace NQRVZEP20
