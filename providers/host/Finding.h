@@ -27,7 +27,8 @@ public:
   TFinding(TMissing why) : fContent(std::move(why)) {}
 
   explicit operator bool() const { return std::holds_alternative<T>(fContent); }
-  T const& operator*() const { return std::get<T>(fContent); }          // only when it is true
+  T const& operator*() const { return std::get<T>(fContent); }  // only when it is true
+  T const* operator->() const { return &std::get<T>(fContent); }
   TMissing const& Why() const { return std::get<TMissing>(fContent); }  // only when it is false
 
 private:

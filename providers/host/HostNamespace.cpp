@@ -8,6 +8,8 @@
 
 #include <sys/utsname.h>
 
+#include <boost/make_shared.hpp>
+
 namespace NQRVZEP20 {
 
 namespace {
@@ -38,7 +40,7 @@ bool Always(TSmbiosStructure const&) { return true; }
 }  // namespace
 
 boost::shared_ptr<ICIMNamespace> MakeHostNamespace() {
-  auto const ns = TMemoryNamespace::Create(kNamespaceName);
+  auto const ns = boost::make_shared<TMemoryNamespace>(kNamespaceName);
   TNamespaceWriter writer(ns);
 
   utsname const kernel = Kernel();

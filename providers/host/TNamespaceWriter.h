@@ -1,11 +1,14 @@
 #pragma once
 
-#include "ICIMNamespace.h"
 #include "TRecord.h"
+
+#include <boost/shared_ptr.hpp>
 
 #include <vector>
 
 namespace NQRVZEP20 {
+
+class TMemoryNamespace;
 
 // Writes records into a namespace.
 //
@@ -17,7 +20,7 @@ namespace NQRVZEP20 {
 class TNamespaceWriter {
 public:
   // Declares what every namespace of this kind has: the qualifiers and ZEP_MissingValue.
-  explicit TNamespaceWriter(boost::shared_ptr<ICIMNamespace> ns);
+  explicit TNamespaceWriter(boost::shared_ptr<TMemoryNamespace> ns);
 
   // The class of the record, with this one instance.
   void Write(TRecord const& record);
@@ -26,12 +29,11 @@ public:
   void Write(TRecord const& shape, std::vector<TRecord> const& records, TMissing const& whyNone);
 
 private:
-  boost::shared_ptr<ICIMClass> Declare(TRecord const& shape);
-  void AddInstance(boost::shared_ptr<ICIMClass> cls, TRecord const& record);
+  void Declare(TRecord const& shape);
+  void AddInstance(TRecord const& record);
   void AddMissing(std::string const& path, std::string const& property, TMissing const& why);
 
-  boost::shared_ptr<ICIMNamespace> fNamespace;
-  boost::shared_ptr<ICIMClass> fMissingValues;
+  boost::shared_ptr<TMemoryNamespace> fNamespace;
 };
 
 }  // namespace NQRVZEP20
