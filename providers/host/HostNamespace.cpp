@@ -8,13 +8,9 @@
 
 #include <sys/utsname.h>
 
-#include <boost/make_shared.hpp>
-
 namespace NQRVZEP20 {
 
 namespace {
-
-constexpr char const* kNamespaceName = "root/zep/host";
 
 utsname Kernel() {
   utsname kernel = {};
@@ -39,8 +35,7 @@ bool Always(TSmbiosStructure const&) { return true; }
 
 }  // namespace
 
-boost::shared_ptr<ICIMNamespace> MakeHostNamespace() {
-  auto const ns = boost::make_shared<TMemoryNamespace>(kNamespaceName);
+void FillHostNamespace(TMemoryNamespace& ns) {
   TNamespaceWriter writer(ns);
 
   utsname const kernel = Kernel();
@@ -64,7 +59,6 @@ boost::shared_ptr<ICIMNamespace> MakeHostNamespace() {
             [&](TSmbiosStructure const& memoryDevice, unsigned number) {
               return MemoryRecord(memoryDevice, tables.SourceOf(kSmbiosMemoryDevice), number);
             });
-  return ns;
 }
 
 }  // namespace NQRVZEP20

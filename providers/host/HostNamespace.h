@@ -1,11 +1,11 @@
 #pragma once
 
-#include "ICIMNamespace.h"
-
 namespace NQRVZEP20 {
 
-// Collects what this machine says of itself, and makes a namespace of it. Where the machine keeps silent, the namespace
-// says why (TNamespaceWriter).
-boost::shared_ptr<ICIMNamespace> MakeHostNamespace();
+class TMemoryNamespace;
+
+// Collects what this machine says of itself and writes it into the namespace, which is empty. Where the machine keeps
+// silent, the namespace says why (TNamespaceWriter).
+void FillHostNamespace(TMemoryNamespace& ns);
 
 }  // namespace NQRVZEP20

@@ -1,8 +1,9 @@
-// The provider plug-in: libHost.nsp.so registers its provider when it is loaded.
+// The provider plug-in. Loading libHost.nsp.so registers the provider "Host", whose namespace is filled when it is first
+// asked for.
 
 #include "HostNamespace.h"
-#include "INamespaceProvider.h"
 #include "TNamespaceProviderManager.h"
+#include "providers/memory/TMemoryProvider.h"
 
 #include <boost/make_shared.hpp>
 
@@ -10,23 +11,11 @@ namespace NQRVZEP20 {
 
 namespace {
 
-// Describes the machine that the process runs on. The first GetNamespace reads the machine; later ones answer from memory.
-class THostProvider : public INamespaceProvider {
-public:
-  std::string const& GetName(TCIMContext const&) const override { return fName; }
-
-  boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const&) override {
-    if (!fNamespace) fNamespace = MakeHostNamespace();
-    return fNamespace;
-  }
-
-private:
-  std::string const fName = "Host";
-  boost::shared_ptr<ICIMNamespace> fNamespace;  // empty until it is asked for
-};
-
 struct TRegistration {
-  TRegistration() { TNamespaceProviderManager::GetInstance()->RegisterNamespaceProvider(boost::make_shared<THostProvider>()); }
+  TRegistration() {
+    TNamespaceProviderManager::GetInstance()->RegisterNamespaceProvider(
+        boost::make_shared<TMemoryProvider>("Host", "root/zep/host", FillHostNamespace));
+  }
 } const gRegistration;
 
 }  // namespace

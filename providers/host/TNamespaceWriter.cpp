@@ -11,10 +11,10 @@ constexpr char const* kMissingValue = "ZEP_MissingValue";
 
 }  // namespace
 
-TNamespaceWriter::TNamespaceWriter(boost::shared_ptr<TMemoryNamespace> ns) : fNamespace(std::move(ns)) {
-  fNamespace->CreateQualifierDecl(kValueSource, TMemoryType("string").GetNull(), ICIMQualifierDecl::kScopeProperty,
-                                  ICIMQualifierDecl::kFlavorDefault, TCIMContext());
-  fNamespace->DefineClass(kMissingValue)
+TNamespaceWriter::TNamespaceWriter(TMemoryNamespace& ns) : fNamespace(ns) {
+  fNamespace.CreateQualifierDecl(kValueSource, TMemoryType("string").GetNull(), ICIMQualifierDecl::kScopeProperty,
+                                 ICIMQualifierDecl::kFlavorDefault, TCIMContext());
+  fNamespace.DefineClass(kMissingValue)
       .Description("A value that could not be had, and why.")
       .Key("ElementPath", "string")
       .Key("ElementProperty", "string")
@@ -34,7 +34,7 @@ void TNamespaceWriter::Write(TRecord const& shape, std::vector<TRecord> const& r
 }
 
 void TNamespaceWriter::Declare(TRecord const& shape) {
-  auto builder = fNamespace->DefineClass(shape.GetClassName());
+  auto builder = fNamespace.DefineClass(shape.GetClassName());
   for (TRecordProperty const& property : shape.GetProperties()) {
     TMemoryType const type(property.fValue.GetType());
     property.fIsKey ? builder.Key(property.fName, type) : builder.Property(property.fName, type);
@@ -46,15 +46,15 @@ void TNamespaceWriter::AddInstance(TRecord const& record) {
   TMemoryValues values;
   for (TRecordProperty const& property : record.GetProperties())
     if (!property.fValue.IsNull()) values.emplace_back(property.fName, property.fValue);
-  std::string const path = fNamespace->AddInstance(record.GetClassName(), values)->GetPath(TCIMContext()).GetPath();
+  std::string const path = fNamespace.AddInstance(record.GetClassName(), values)->GetPath(TCIMContext()).GetPath();
 
   for (TRecordProperty const& property : record.GetProperties())
     if (property.fValue.IsNull()) AddMissing(path, property.fName, property.fMissing);
 }
 
 void TNamespaceWriter::AddMissing(std::string const& path, std::string const& property, TMissing const& why) {
-  fNamespace->AddInstance(kMissingValue,
-                          {{"ElementPath", path}, {"ElementProperty", property}, {"Code", why.fCode}, {"Reason", why.fReason}});
+  fNamespace.AddInstance(kMissingValue,
+                         {{"ElementPath", path}, {"ElementProperty", property}, {"Code", why.fCode}, {"Reason", why.fReason}});
 }
 
 }  // namespace NQRVZEP20

@@ -2,8 +2,6 @@
 
 #include "TRecord.h"
 
-#include <boost/shared_ptr.hpp>
-
 #include <vector>
 
 namespace NQRVZEP20 {
@@ -20,7 +18,7 @@ class TMemoryNamespace;
 class TNamespaceWriter {
 public:
   // Declares what every namespace of this kind has: the qualifiers and ZEP_MissingValue.
-  explicit TNamespaceWriter(boost::shared_ptr<TMemoryNamespace> ns);
+  explicit TNamespaceWriter(TMemoryNamespace& ns);
 
   // The class of the record, with this one instance.
   void Write(TRecord const& record);
@@ -33,7 +31,7 @@ private:
   void AddInstance(TRecord const& record);
   void AddMissing(std::string const& path, std::string const& property, TMissing const& why);
 
-  boost::shared_ptr<TMemoryNamespace> fNamespace;
+  TMemoryNamespace& fNamespace;
 };
 
 }  // namespace NQRVZEP20
