@@ -59,6 +59,7 @@ void FillHostNamespace(TMemoryNamespace& ns) {
             [&](TSmbiosStructure const& memoryDevice, unsigned number) {
               return MemoryRecord(memoryDevice, tables.SourceOf(kSmbiosMemoryDevice), number);
             });
+  writer.WriteMissing();
 }
 
 }  // namespace NQRVZEP20

@@ -1,5 +1,6 @@
 #include "TNamespaceWriter.h"
 
+#include "ICIMQualifierDecl.h"
 #include "providers/memory/TMemoryNamespace.h"
 
 namespace NQRVZEP20 {
@@ -7,19 +8,21 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr char const* kValueSource = "ValueSource";
-constexpr char const* kMissingValue = "ZEP_MissingValue";
+
+TRecord MissingRecord(std::string const& path, std::string const& property, TMissing const& why) {
+  TRecord record("ZEP_MissingValue", "");
+  record.AddKey("ElementPath", path);
+  record.AddKey("ElementProperty", property);
+  record.Add("Code", TFinding<std::string>(why.fCode));
+  record.Add("Reason", TFinding<std::string>(why.fReason));
+  return record;
+}
 
 }  // namespace
 
 TNamespaceWriter::TNamespaceWriter(TMemoryNamespace& ns) : fNamespace(ns) {
   fNamespace.CreateQualifierDecl(kValueSource, TMemoryType("string").GetNull(), ICIMQualifierDecl::kScopeProperty,
                                  ICIMQualifierDecl::kFlavorDefault, TCIMContext());
-  fNamespace.DefineClass(kMissingValue)
-      .Description("A value that could not be had, and why.")
-      .Key("ElementPath", "string")
-      .Key("ElementProperty", "string")
-      .Property("Code", "string")
-      .Property("Reason", "string");
 }
 
 void TNamespaceWriter::Write(TRecord const& record) {
@@ -53,8 +56,12 @@ void TNamespaceWriter::AddInstance(TRecord const& record) {
 }
 
 void TNamespaceWriter::AddMissing(std::string const& path, std::string const& property, TMissing const& why) {
-  fNamespace.AddInstance(kMissingValue,
-                         {{"ElementPath", path}, {"ElementProperty", property}, {"Code", why.fCode}, {"Reason", why.fReason}});
+  fMissing.push_back(MissingRecord(path, property, why));
+}
+
+void TNamespaceWriter::WriteMissing() {
+  Declare(MissingRecord("", "", {}));
+  for (TRecord const& record : fMissing) AddInstance(record);
 }
 
 }  // namespace NQRVZEP20

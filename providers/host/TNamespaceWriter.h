@@ -17,7 +17,7 @@ class TMemoryNamespace;
 //   Code, Reason     why, as TMissing has them
 class TNamespaceWriter {
 public:
-  // Declares what every namespace of this kind has: the qualifiers and ZEP_MissingValue.
+  // Declares the qualifier.
   explicit TNamespaceWriter(TMemoryNamespace& ns);
 
   // The class of the record, with this one instance.
@@ -26,12 +26,16 @@ public:
   // The class of which `shape` is an example, with these instances, or with the reason why there are none.
   void Write(TRecord const& shape, std::vector<TRecord> const& records, TMissing const& whyNone);
 
+  // Writes what was missing. The last call.
+  void WriteMissing();
+
 private:
   void Declare(TRecord const& shape);
   void AddInstance(TRecord const& record);
   void AddMissing(std::string const& path, std::string const& property, TMissing const& why);
 
   TMemoryNamespace& fNamespace;
+  std::vector<TRecord> fMissing;
 };
 
 }  // namespace NQRVZEP20

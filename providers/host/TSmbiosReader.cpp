@@ -32,8 +32,8 @@ TMissing WhyTablesFailed(int status, std::string const& tableFile) {
     if (status == kSmbiosAccessDenied) return {kMissingUnreadable, what + " may not be read by this user"};
     return {kMissingUnreadable, what + " holds no SMBIOS table"};
   }
-  if (status == kSmbiosFileNotFound) return {kMissingNoTables, "the system exports no SMBIOS tables"};
-  if (status == kSmbiosAccessDenied) return {kMissingNeedsRoot, "needs root: this user may not read the SMBIOS tables"};
+  if (status == kSmbiosFileNotFound) return {kMissingNoTables, "no SMBIOS tables exported"};
+  if (status == kSmbiosAccessDenied) return {kMissingNeedsRoot, "needs root (SMBIOS tables)"};
   return {kMissingUnreadable, "the system's SMBIOS tables cannot be read"};
 }
 
@@ -133,7 +133,7 @@ std::vector<TSmbiosStructure> TSmbiosReader::All(int type) const {
 
 std::string TSmbiosReader::SourceOf(int type) const {
   std::string const source = "SMBIOS type " + std::to_string(type);
-  return fTableFile.empty() ? source : source + " in " + fTableFile;
+  return fTableFile.empty() ? source : source + " (file)";
 }
 
 TMissing TSmbiosReader::WhyNone(int type) const {

@@ -23,7 +23,7 @@ public:
   // Every structure of that type, in the order of the table. With a library that cannot go on after the first: the first.
   std::vector<TSmbiosStructure> All(int type) const;
 
-  // What a structure of that type is a source of values as: "SMBIOS type 17", with the file where it is not this machine's.
+  // What the values of such a structure come from: "SMBIOS type 17", or "SMBIOS type 17 (file)".
   std::string SourceOf(int type) const;
 
   // Why there is no structure of that type.

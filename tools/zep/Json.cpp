@@ -25,8 +25,9 @@ TJson ArrayAsJson(std::vector<TCIMValue> const& elements) {
 TJson PropertyAsJson(TNamespaceView const& view, ICIMInstance const& instance, ICIMProperty const& property) {
   TCIMValue const value = property.GetValue(TCIMContext());
   TJson json = {{"type", NameOf(value.GetType())}, {"value", ValueAsJson(value)}};
-  if (property.GetDeclaration(TCIMContext())->IsKey(TCIMContext())) json["key"] = true;
-  json["source"] = view.SourceOf(property);
+  auto const declaration = property.GetDeclaration(TCIMContext());
+  if (declaration->IsKey(TCIMContext())) json["key"] = true;
+  json["source"] = view.SourceOf(*declaration);
   if (value.IsNull()) {
     TMissing const why = view.WhyMissing(instance, property.GetName(TCIMContext()));
     json["code"] = why.fCode;

@@ -9,6 +9,7 @@
 #include <algorithm>
 #include <chrono>
 #include <exception>
+#include <filesystem>
 #include <map>
 #include <stdexcept>
 
@@ -100,6 +101,6 @@ std::vector<TNamespaceView> ViewsOf(std::vector<TPlugIn> const& plugIns) {
   return views;
 }
 
-std::string PlugInDirectory() { return TOSSpecific::GetZEPRootPath(); }
+std::string PlugInDirectory() { return std::filesystem::path(TOSSpecific::GetZEPRootPath()).lexically_normal().string(); }
 
 }  // namespace NQRVZEP20::zep

@@ -57,7 +57,7 @@ bool IsBlank(std::string const& text) { return text.find_first_not_of(" \t") == 
 // What the helper answers; where it refuses, the reason is looked for in the property itself.
 TAnswer Ask(TNamespaceView const& view, TQuestion const& question) {
   auto const instances = view.InstancesOf(question.className);
-  if (instances.empty()) return TAnswer::Unknown(view.WhyNoInstance(question.className), "");
+  if (instances.empty()) return view.AnswerWithoutInstance(question.className, question.property);
   if (instances.size() > 1)
     return TAnswer::Unknown({kMissingUnexpected, "the provider describes " + std::to_string(instances.size()) + " of them"}, "");
 
@@ -105,13 +105,13 @@ TAnswer AskEveryone(TViews const& views, std::vector<TPlugIn> const& plugIns, TA
 
 TAnswer PropertyOfFirst(TNamespaceView const& view, char const* className, char const* property) {
   auto const instances = view.InstancesOf(className);
-  if (instances.empty()) return TAnswer::Unknown(view.WhyNoInstance(className), "");
+  if (instances.empty()) return view.AnswerWithoutInstance(className, property);
   return view.Answer(*instances.front(), property);
 }
 
 TAnswer BiosDate(TNamespaceView const& view) {
   auto const instances = view.InstancesOf("CIM_BIOSElement");
-  if (instances.empty()) return TAnswer::Unknown(view.WhyNoInstance("CIM_BIOSElement"), "");
+  if (instances.empty()) return view.AnswerWithoutInstance("CIM_BIOSElement", "ReleaseDate");
   TAnswer answer = view.Answer(*instances.front(), "ReleaseDate");
   if (!answer.fIsKnown) return answer;
   TCIMDateTime const date = instances.front()->GetProperty("ReleaseDate", TCIMContext())->GetValue(TCIMContext());
@@ -123,7 +123,7 @@ TAnswer BiosDate(TNamespaceView const& view) {
 // "2 x Example Processor, 24 cores"
 TAnswer Processors(TNamespaceView const& view) {
   auto const processors = view.InstancesOf("CIM_Processor");
-  if (processors.empty()) return TAnswer::Unknown(view.WhyNoInstance("CIM_Processor"), "");
+  if (processors.empty()) return view.AnswerWithoutInstance("CIM_Processor", "ElementName");
   std::map<std::string, unsigned> countOfKind;
   unsigned long cores = 0;
   bool areCoresKnown = true;
@@ -152,7 +152,7 @@ std::string AsSize(unsigned long bytes) {
 // "128 GiB in 8 modules"
 TAnswer Memory(TNamespaceView const& view) {
   auto const modules = view.InstancesOf("CIM_PhysicalMemory");
-  if (modules.empty()) return TAnswer::Unknown(view.WhyNoInstance("CIM_PhysicalMemory"), "");
+  if (modules.empty()) return view.AnswerWithoutInstance("CIM_PhysicalMemory", "Capacity");
   unsigned long bytes = 0, unknown = 0;
   TAnswer capacity = TAnswer::Unknown({}, "");
   for (auto const& module : modules) {

@@ -64,6 +64,7 @@ std::string ReportAsJson(TReport const& report) {
   document["status"] = NameOf(report.fStatus);
   document["exitStatus"] = static_cast<int>(report.fStatus);
   document["head"] = report.fHead;
+  document["smbiosTableFile"] = TextOrNull(TableFile());
   document["identity"] = RowsAsJson(report.fIdentity);
   document["details"] = RowsAsJson(report.fDetails);
   document["plugInDirectory"] = PlugInDirectory();

@@ -11,7 +11,7 @@ namespace {
 std::string Title(std::string const& title) { return IsSampleSelected() ? std::string(kSampleLabel) + " " + title : title; }
 
 std::string RowsAsText(std::string const& title, std::vector<TReportRow> const& rows) {
-  TTable table({16, 34, 26});
+  TTable table({15, 36, 25});
   table.Add({Title(title), "Value", "Source"});
   for (TReportRow const& row : rows) {
     TAnswer const& answer = row.fAnswer;
@@ -40,7 +40,7 @@ std::string WhatHappened(TPlugIn const& plugIn) {
 }
 
 std::string PlugInsAsText(std::vector<TPlugIn> const& plugIns) {
-  TTable table({16, 10, 50});
+  TTable table({15, 10, 51});
   table.Add({Title("Plug-in"), "Time", "Result"});
   for (TPlugIn const& plugIn : plugIns) {
     double milliseconds = plugIn.fMilliseconds;
@@ -56,6 +56,7 @@ std::string PlugInsAsText(std::vector<TPlugIn> const& plugIns) {
 std::string ReportAsText(TReport const& report) {
   std::string text;
   for (std::string const& line : report.fHead) text += Printable(line) + "\n";
+  if (!TableFile().empty()) text += Printable("SMBIOS tables read from the file " + TableFile() + " (ZEP_SMBIOS_TABLE)") + "\n";
   return text + "\n" + RowsAsText("Identity", report.fIdentity) + "\n" + RowsAsText("Details", report.fDetails) + "\n" +
          PlugInsAsText(report.fPlugIns);
 }

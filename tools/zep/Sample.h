@@ -17,6 +17,10 @@ void SelectSample();
 
 bool IsSampleSelected();
 
+// The table file that the caller of zep has named in ZEP_SMBIOS_TABLE, in place of this machine's tables. Empty for none, and
+// for the sample.
+std::string TableFile();
+
 // Where a value comes from, as it is to be printed: with its label when the sample is selected, else as it is.
 std::string LabelledSource(std::string const& source);
 

@@ -65,9 +65,9 @@ std::string TNamespaceView::PathOf(ICIMInstance const& instance) const {
   return GetName() + ":" + instance.GetPath(TCIMContext()).GetPath();
 }
 
-std::string TNamespaceView::SourceOf(ICIMProperty const& property) const {
-  auto const source = property.GetDeclaration(TCIMContext())->GetQualifier("ValueSource", TCIMContext());
-  return LabelledSource(source ? source->GetValue(TCIMContext()).ToString() : "provider " + fProviderName);
+std::string TNamespaceView::SourceOf(ICIMPropertyDecl const& property) const {
+  auto const source = property.GetQualifier("ValueSource", TCIMContext());
+  return source ? LabelledSource(source->GetValue(TCIMContext()).ToString()) : "provider " + fProviderName;
 }
 
 TMissing TNamespaceView::WhyMissing(ICIMInstance const& instance, std::string const& property) const {
@@ -75,16 +75,22 @@ TMissing TNamespaceView::WhyMissing(ICIMInstance const& instance, std::string co
 }
 
 TMissing TNamespaceView::WhyNoInstance(std::string const& className) const {
-  return WhyMissing(className, "", {kMissingNotDescribed, "no provider describes it"});
+  return WhyMissing(className, "", {kMissingNotDescribed, "the provider describes none"});
 }
 
 TAnswer TNamespaceView::Answer(ICIMInstance const& instance, std::string const& name) const {
   auto const property = instance.GetProperty(name, TCIMContext());
-  if (!property)
-    return TAnswer::Unknown({kMissingNotGiven, "the provider knows no property " + name}, "provider " + fProviderName);
+  if (!property) return TAnswer::Unknown({kMissingNotGiven, "the provider knows no property " + name}, "");
+  std::string const source = SourceOf(*property->GetDeclaration(TCIMContext()));
   TCIMValue const value = property->GetValue(TCIMContext());
-  if (value.IsNull()) return TAnswer::Unknown(WhyMissing(instance, name), SourceOf(*property));
-  return TAnswer::Known(value.ToString(), SourceOf(*property));
+  if (value.IsNull()) return TAnswer::Unknown(WhyMissing(instance, name), source);
+  return TAnswer::Known(value.ToString(), source);
+}
+
+TAnswer TNamespaceView::AnswerWithoutInstance(std::string const& className, std::string const& property) const {
+  auto const cls = FindClass(className);
+  if (!cls) return TAnswer::Unknown({kMissingNotDescribed, "no provider describes it"}, "");
+  return TAnswer::Unknown(WhyNoInstance(className), SourceOf(*cls->GetPropertyDecl(property, TCIMContext())));
 }
 
 TMissing TNamespaceView::WhyMissing(std::string const& path, std::string const& property, TMissing const& otherwise) const {

@@ -8,7 +8,7 @@
 #include <vector>
 
 namespace NQRVZEP20 {
-class ICIMProperty;
+class ICIMPropertyDecl;
 }
 
 namespace NQRVZEP20::zep {
@@ -56,12 +56,15 @@ public:
   // The object path with the namespace in front: "root/zep/host:CIM_Chassis.Tag=...".
   std::string PathOf(ICIMInstance const& instance) const;
 
-  std::string SourceOf(ICIMProperty const& property) const;
+  std::string SourceOf(ICIMPropertyDecl const& property) const;
   TMissing WhyMissing(ICIMInstance const& instance, std::string const& property) const;
   TMissing WhyNoInstance(std::string const& className) const;
 
   // A property of an instance.
   TAnswer Answer(ICIMInstance const& instance, std::string const& property) const;
+
+  // The same where the class has no instance to ask, or is not there itself.
+  TAnswer AnswerWithoutInstance(std::string const& className, std::string const& property) const;
 
 private:
   TMissing WhyMissing(std::string const& path, std::string const& property, TMissing const& otherwise) const;
