@@ -48,7 +48,8 @@ public:
   // ---- Console, time and host probes (TOSSpecificConsole.cpp) ----
 
   // Now, as local time to the millisecond. The UTC offset is that of the zone's standard time, plus 60 while daylight
-  // saving is in force (60 also where the zone shifts by another amount). TZ is looked at on each call.
+  // saving is in force: 60 also where the zone shifts by half an hour or, as Ireland does in winter, backwards. TZ is
+  // looked at on each call.
   static TCIMDateTime GetLocalTime();
 
   // ---- Plug-ins (TOSSpecificPlugins.cpp) ----

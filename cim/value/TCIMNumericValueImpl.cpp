@@ -102,7 +102,6 @@ TCIMNumericValueImpl::operator double() const {
   return fReal64;
 }
 
-
 std::string TCIMNumericValueImpl::ToString(unsigned char radix) const {
   if (radix != 10 && radix != 16 && radix != 8) throw TZEPException(kZEPStatusNotSupported);
   return OnNumber<std::string>(fType, *this, [&](auto number) { return TextOf(number, radix); });

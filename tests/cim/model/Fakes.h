@@ -12,6 +12,7 @@
 #include "ICIMQualifier.h"
 #include "TZEPException.h"
 
+#include <boost/enable_shared_from_this.hpp>
 #include <boost/make_shared.hpp>
 
 #include <optional>

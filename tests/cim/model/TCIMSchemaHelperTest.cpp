@@ -606,22 +606,24 @@ TEST_F(TCIMSchemaHelperEsxiTest, APlaceholderGivesWayToTheOtherIdentifyingInfo) 
 TEST_F(TCIMSchemaHelperEsxiTest, TheOtherIdentifyingInfoIsTheTextBehindTheColonOfTheFirstEntryWithOne) {
   TCIMValue const withNull(ECIMType::kCIMTypeString, 0, {NullOf(ECIMType::kCIMTypeString), TCIMValue("SN:A")});
   struct {
+    char const* what;
     TCIMValue info;
     char const* result;
   } const kRows[] = {
-      {Strings({"a:b:c", "d:e"}), "b:c"},
-      {Strings({"SN: KQ1234A "}), " KQ1234A "},
-      {Strings({"SN:"}), ""},
-      {Strings({"a", "b"}), "Unknown"},
-      {Strings({}), "Unknown"},
-      {withNull, "A"},
-      {TCIMValue("SN:A"), "Unknown"},
-      {TCIMValue(5u), "Unknown"},
-      {NullOf(ECIMType::kCIMTypeString), "Unknown"},
-      {TCIMValue(ECIMType::kCIMTypeUint32, 0, {TCIMValue(5u)}), "Unknown"},
+      {"two with a colon", Strings({"a:b:c", "d:e"}), "b:c"},
+      {"blanks", Strings({"SN: KQ1234A "}), " KQ1234A "},
+      {"nothing behind the colon", Strings({"SN:"}), ""},
+      {"no colon", Strings({"a", "b"}), "Unknown"},
+      {"no entry", Strings({}), "Unknown"},
+      {"a NULL entry", withNull, "A"},
+      {"no array", TCIMValue("SN:A"), "Unknown"},
+      {"a number", TCIMValue(5u), "Unknown"},
+      {"numbers", TCIMValue(ECIMType::kCIMTypeUint32, 0, {TCIMValue(5u)}), "Unknown"},
+      {"NULL", NullOf(ECIMType::kCIMTypeString), "Unknown"},
+      {"a NULL array", TCIMValue(ECIMType::kCIMTypeString, 4), "Unknown"},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.info.IsNull() ? "NULL" : row.info.ToString(10).substr(0, 20));
+    SCOPED_TRACE(row.what);
     auto const ns = boost::make_shared<TFakeNamespace>();
     ns->Add("OMC_Chassis").AddInstance()->Add("SerialNumber", TCIMValue("none"));
     ns->Add("OMC_UnitaryComputerSystem").AddInstance()->Add("OtherIdentifyingInfo", row.info);
