@@ -4,6 +4,7 @@
 
 #include <dlfcn.h>
 
+#include <algorithm>
 #include <cstdlib>
 
 namespace NQRVZEP20 {
@@ -14,7 +15,7 @@ constexpr char const* kTableFileVariable = "ZEP_SMBIOS_TABLE";
 constexpr char const* kLibraryName = "libsmbios.so";
 
 constexpr std::size_t kLargestStructure = 64 * 1024;  // what is longer is cut
-constexpr std::size_t kMostStructures = 65536;        // of one type: handles have 16 bits
+constexpr std::size_t kMostStructures = 4096;         // of one type, so that no library keeps us for ever
 
 struct TLibraryCloser {
   void operator()(void* library) const { ::dlclose(library); }
@@ -102,11 +103,11 @@ struct TSmbiosReader::TLibrary {
 
   // The structure that `get` hands out; empty when there is none.
   std::vector<unsigned char> Read(TGetStructure* get, int type) const {
-    std::vector<unsigned char> bytes(kLargestStructure);
-    int length = static_cast<int>(bytes.size());
-    if (get(tables, type, bytes.data(), &length) != kSmbiosOk || length <= 0) return {};
-    if (static_cast<std::size_t>(length) < bytes.size()) bytes.resize(length);
-    return bytes;
+    std::vector<unsigned char> buffer(kLargestStructure);
+    int length = static_cast<int>(buffer.size());
+    if (get(tables, type, buffer.data(), &length) != kSmbiosOk || length <= 0) return {};
+    auto const size = std::min<std::size_t>(static_cast<std::size_t>(length), buffer.size());
+    return std::vector<unsigned char>(buffer.begin(), buffer.begin() + static_cast<std::ptrdiff_t>(size));
   }
 };
 

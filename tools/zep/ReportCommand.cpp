@@ -31,6 +31,9 @@ TRun AddReportArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.add_flag("--sample", arguments->fSample, "Report on the bundled table of an invented server, labelled SAMPLE");
+  command.footer(
+      "Exit status: 0 when everything could be told, 2 when the report says what is missing, 1 when nothing\n"
+      "could be told, 64 for wrong usage.");
   return [arguments] { return Report(*arguments); };
 }
 

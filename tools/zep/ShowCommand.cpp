@@ -18,6 +18,7 @@
 
 #include <iostream>
 #include <memory>
+#include <set>
 
 namespace NQRVZEP20::zep {
 
@@ -70,42 +71,59 @@ std::string InstanceAsText(TNamespaceView const& view, ICIMInstance const& insta
   return Heading(view.PathOf(instance)) + table.GetText();
 }
 
-std::string ClassAsText(TNamespaceView const& view, ICIMClass const& cls) {
+// The class and those above it, the topmost first.
+std::vector<boost::shared_ptr<ICIMClass const>> LineageOf(boost::shared_ptr<ICIMClass const> cls) {
+  std::vector<boost::shared_ptr<ICIMClass const>> lineage;
+  for (; cls; cls = cls->GetSuperClass(TCIMContext())) lineage.insert(lineage.begin(), cls);
+  return lineage;
+}
+
+// Calls back with every property that instances of the class have. One that a class declares again is taken where it is
+// declared last.
+template <class TCallback>
+void ForEachProperty(ICIMClass const& cls, std::vector<boost::shared_ptr<ICIMClass const>> const& lineage, TCallback callback) {
+  std::set<std::string> seen;
+  for (auto const& ancestor : lineage)
+    ancestor->EnumeratePropertyDecls(
+        [&](boost::shared_ptr<ICIMPropertyDecl> property) {
+          std::string const name = property->GetName(TCIMContext());
+          if (seen.insert(name).second) callback(*cls.GetPropertyDecl(name, TCIMContext()));
+          return true;
+        },
+        TCIMContext());
+}
+
+std::string ClassAsText(TNamespaceView const& view, boost::shared_ptr<ICIMClass const> cls) {
+  auto const lineage = LineageOf(cls);
+  std::string const name = cls->GetName(TCIMContext());
+  std::string heading = view.GetName() + ":" + name;
+  for (std::size_t at = lineage.size() - 1; at-- > 0;) heading += " : " + lineage[at]->GetName(TCIMContext());
+
   TTable table({24, 10, 5, 35});
   table.Add({"Property", "Type", "Key", "Default"});
-  cls.EnumeratePropertyDecls(
-      [&](boost::shared_ptr<ICIMPropertyDecl> property) {
-        TCIMValue const value = property->GetDefaultValue(TCIMContext());
-        table.Add({property->GetName(TCIMContext()), NameOf(property->GetType(TCIMContext())),
-                   property->IsKey(TCIMContext()) ? "key" : "", TextOf(value)});
-        return true;
-      },
-      TCIMContext());
+  ForEachProperty(*cls, lineage, [&](ICIMPropertyDecl const& property) {
+    table.Add({property.GetName(TCIMContext()), NameOf(property.GetType(TCIMContext())),
+               property.IsKey(TCIMContext()) ? "key" : "", TextOf(property.GetDefaultValue(TCIMContext()))});
+  });
 
-  std::string const name = cls.GetName(TCIMContext());
-  auto const superClass = cls.GetSuperClass(TCIMContext());
-  std::string text = Heading(view.GetName() + ":" + name + (superClass ? " : " + superClass->GetName(TCIMContext()) : ""));
-  text += table.GetText() + "\nInstances\n";
+  std::string text = Heading(heading) + table.GetText() + "\nInstances\n";
   auto const instances = view.InstancesOf(name);
   for (auto const& instance : instances) text += Printable(view.PathOf(*instance)) + "\n";
   if (instances.empty()) text += Printable("none: " + view.WhyNoInstance(name).fReason) + "\n";
   return text;
 }
 
-TJson ClassAsJson(TNamespaceView const& view, ICIMClass const& cls) {
+TJson ClassAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMClass const> cls) {
   TJson properties = TJson::object();
-  cls.EnumeratePropertyDecls(
-      [&](boost::shared_ptr<ICIMPropertyDecl> property) {
-        properties[property->GetName(TCIMContext())] = {{"type", NameOf(property->GetType(TCIMContext()))},
-                                                        {"key", property->IsKey(TCIMContext())},
-                                                        {"default", ValueAsJson(property->GetDefaultValue(TCIMContext()))}};
-        return true;
-      },
-      TCIMContext());
-  std::string const name = cls.GetName(TCIMContext());
+  ForEachProperty(*cls, LineageOf(cls), [&](ICIMPropertyDecl const& property) {
+    properties[property.GetName(TCIMContext())] = {{"type", NameOf(property.GetType(TCIMContext()))},
+                                                   {"key", property.IsKey(TCIMContext())},
+                                                   {"default", ValueAsJson(property.GetDefaultValue(TCIMContext()))}};
+  });
+  std::string const name = cls->GetName(TCIMContext());
   TJson instances = TJson::array();
   for (auto const& instance : view.InstancesOf(name)) instances.push_back(view.PathOf(*instance));
-  auto const superClass = cls.GetSuperClass(TCIMContext());
+  auto const superClass = cls->GetSuperClass(TCIMContext());
   return {{"class", name},
           {"namespace", view.GetName()},
           {"provider", view.GetProviderName()},
@@ -114,15 +132,24 @@ TJson ClassAsJson(TNamespaceView const& view, ICIMClass const& cls) {
           {"instances", instances}};
 }
 
-std::string ElementAsText(TNamespaceView const& view, ICIMElement const& element) {
-  if (auto const* instance = dynamic_cast<ICIMInstance const*>(&element)) return InstanceAsText(view, *instance);
-  return ClassAsText(view, dynamic_cast<ICIMClass const&>(element));
+// A path names an instance or a class.
+template <class TOfInstance, class TOfClass>
+auto ForElement(boost::shared_ptr<ICIMElement> const& element, TOfInstance ofInstance, TOfClass ofClass) {
+  auto const instance = boost::dynamic_pointer_cast<ICIMInstance const>(element);
+  return instance ? ofInstance(*instance) : ofClass(boost::dynamic_pointer_cast<ICIMClass const>(element));
 }
 
-std::string ElementAsJson(TNamespaceView const& view, ICIMElement const& element) {
+std::string ElementAsText(TNamespaceView const& view, boost::shared_ptr<ICIMElement> const& element) {
+  return ForElement(
+      element, [&](ICIMInstance const& instance) { return InstanceAsText(view, instance); },
+      [&](boost::shared_ptr<ICIMClass const> cls) { return ClassAsText(view, cls); });
+}
+
+std::string ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElement> const& element) {
   TJson document = DocumentHead("zep show");
-  auto const* instance = dynamic_cast<ICIMInstance const*>(&element);
-  document["object"] = instance ? InstanceAsJson(view, *instance) : ClassAsJson(view, dynamic_cast<ICIMClass const&>(element));
+  document["object"] = ForElement(
+      element, [&](ICIMInstance const& instance) { return InstanceAsJson(view, instance); },
+      [&](boost::shared_ptr<ICIMClass const> cls) { return ClassAsJson(view, cls); });
   return AsText(document);
 }
 
@@ -131,7 +158,7 @@ int Show(TArguments const& arguments) {
   for (TNamespaceView const& view : ViewsOf(LoadPlugIns())) {
     auto const element = Find(view, arguments.fPath);
     if (!element) continue;
-    WriteOutput(arguments.fAsJson ? ElementAsJson(view, *element) : ElementAsText(view, *element));
+    WriteOutput(arguments.fAsJson ? ElementAsJson(view, element) : ElementAsText(view, element));
     return kExitComplete;
   }
   std::cerr << "zep: no provider has the object " << Printable(arguments.fPath) << '\n';
@@ -148,6 +175,7 @@ TRun AddShowArguments(CLI::App& command) {
       ->required();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.add_flag("--sample", arguments->fSample, "Show objects of the bundled table of an invented server, labelled SAMPLE");
+  command.footer("Exit status: 0 when there is such an object, 1 when there is none, 64 for wrong usage.");
   return [arguments] { return Show(*arguments); };
 }
 

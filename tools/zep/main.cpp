@@ -19,19 +19,15 @@ constexpr TCommand kCommands[] = {
     {"show", "Print one object or class of the providers' namespaces", AddShowArguments},
 };
 
-constexpr char const* kExitStatuses =
-    "Exit status: 0 complete, 1 nothing could be told, 2 some of it could not be told, 64 wrong usage.";
-
 int Run(int argc, char const* const* argv) {
   CLI::App app("zep tells what a server knows of itself, through the provider plug-ins beside libzepcore.so.", "zep");
   app.set_version_flag("--version", "zep " ZEP_VERSION " (build " ZEP_BUILD_ID ")");
   app.require_subcommand(1);
-  app.footer(kExitStatuses);
+  app.footer("zep COMMAND --help tells more of a command.");
 
   std::map<CLI::App const*, TRun> runs;
   for (TCommand const& command : kCommands) {
     CLI::App* const added = app.add_subcommand(command.fName, command.fDescription);
-    added->footer(kExitStatuses);
     runs[added] = command.fAddArguments(*added);
   }
 
