@@ -161,7 +161,7 @@ int Show(TArguments const& arguments) {
     WriteOutput(arguments.fAsJson ? ElementAsJson(view, element) : ElementAsText(view, element));
     return kExitComplete;
   }
-  std::cerr << "zep: no provider has the object " << Printable(arguments.fPath) << '\n';
+  std::cerr << "zep: no provider has the object \"" << Printable(arguments.fPath) << "\"\n";
   return kExitNothing;
 }
 

@@ -45,6 +45,8 @@ std::string Escaped(std::uint32_t code) {
   return text;
 }
 
+std::string WithoutTrailingBlanks(std::string_view text) { return std::string(text.substr(0, text.find_last_not_of(' ') + 1)); }
+
 // Where to break a text that is wider than `width`: behind that many characters, or at the last blank before.
 std::size_t BreakOf(std::string_view text, std::size_t width) {
   std::size_t end = 0;
@@ -80,11 +82,11 @@ std::vector<std::string> Wrapped(std::string_view text, std::size_t width) {
   std::vector<std::string> lines;
   while (WidthOf(text) > width) {
     std::size_t const end = BreakOf(text, width);
-    lines.emplace_back(text.substr(0, end));
+    lines.push_back(WithoutTrailingBlanks(text.substr(0, end)));
     text.remove_prefix(end);
     text.remove_prefix(std::min(text.find_first_not_of(' '), text.size()));
   }
-  if (!text.empty() || lines.empty()) lines.emplace_back(text);
+  if (!text.empty() || lines.empty()) lines.push_back(WithoutTrailingBlanks(text));
   return lines;
 }
 
