@@ -447,11 +447,16 @@ TEST_F(ReportTest, AProviderThatFailsIsToldAndStopsNoOther) {
   }
 }
 
-TEST_F(ReportTest, ANamespaceThatFailsLaterIsToldInItsRows) {
+TEST_F(ReportTest, ANamespaceThatFailsLaterIsToldWhereItFails) {
   zep_.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("fails-later");
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: provider Test failed: kZEPStatusFail");
+
+  auto const document = JsonOf(RunWithTestProvider("fails-later", {"--json"}));
+  EXPECT_THAT(document["instances"], IsEmpty());
+  EXPECT_EQ(document["instanceFailures"][0]["provider"], "Test");
+  EXPECT_EQ(document["instanceFailures"][0]["error"], "it threw something that is no exception of the standard library");
 }
 
 TEST_F(ReportTest, APlugInThatRegistersNothingIsTold) {
