@@ -23,8 +23,8 @@ class TMemoryQualifierDecl;
 //   ns->AddInstance("X_Disk", {{"Id", 5}, {"Name", "sda"}});
 //
 // Always held by boost::shared_ptr. It owns everything in it and lets go of everything when it goes: a class that someone
-// still holds then is empty, an instance keeps its values but for references, and whatever asks for the namespace, the class
-// or the superclass throws boost::bad_weak_ptr. Lookups by name and by object path take constant time. Contexts are ignored.
+// still holds then is empty, an instance keeps its values but for references, and what looks for the namespace, or for a
+// class that nobody holds, throws boost::bad_weak_ptr. Lookups by name and by object path take constant time. Contexts are ignored.
 class TMemoryNamespace : public ICIMNamespace, public boost::enable_shared_from_this<TMemoryNamespace> {
 public:
   // Empty: without classes and without qualifier declarations.

@@ -33,23 +33,23 @@ inline TCIMContext const kNone;
 template <class TOwner, class X>
 using TEnumeration = void (TOwner::*)(boost::function<bool(boost::shared_ptr<X>)>, TCIMContext const&) const;
 
-template <class TOwner, class X>
-std::vector<boost::shared_ptr<X>> All(TOwner const& owner, TEnumeration<TOwner, X> enumerate) {
+template <class TAny, class TOwner, class X>
+std::vector<boost::shared_ptr<X>> All(TAny const& owner, TEnumeration<TOwner, X> enumerate) {
   std::vector<boost::shared_ptr<X>> elements;
   (owner.*enumerate)(TAddToVectorCallback<X>(elements), kNone);
   return elements;
 }
 
-template <class TOwner, class X>
-std::vector<std::string> Names(TOwner const& owner, TEnumeration<TOwner, X> enumerate) {
+template <class TAny, class TOwner, class X>
+std::vector<std::string> Names(TAny const& owner, TEnumeration<TOwner, X> enumerate) {
   std::vector<std::string> names;
   for (auto const& element : All(owner, enumerate)) names.push_back(element->GetName(kNone));
   return names;
 }
 
 // How many elements an enumeration visits when the second call returns false.
-template <class TOwner, class X>
-int VisitsUntilSecond(TOwner const& owner, TEnumeration<TOwner, X> enumerate) {
+template <class TAny, class TOwner, class X>
+int VisitsUntilSecond(TAny const& owner, TEnumeration<TOwner, X> enumerate) {
   int visits = 0;
   (owner.*enumerate)([&](boost::shared_ptr<X> const&) { return ++visits < 2; }, kNone);
   return visits;

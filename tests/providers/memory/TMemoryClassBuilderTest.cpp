@@ -28,7 +28,7 @@ TEST_F(TMemoryClassBuilderTest, DescribesPropertiesInTheirOrder) {
                        .Property("Sectors", "uint16", 512)
                        .Property("Tags", "string[4]", TCIMValue(TType::kCIMTypeString, 0, {TCIMValue("a")}))
                        .Class();
-  EXPECT_THAT(Names<ICIMClass>(*cls, &ICIMClass::EnumeratePropertyDecls), ElementsAre("Id", "Name", "Sectors", "Tags"));
+  EXPECT_THAT(Names(*cls, &ICIMClass::EnumeratePropertyDecls), ElementsAre("Id", "Name", "Sectors", "Tags"));
   EXPECT_TRUE(cls->GetPropertyDecl("Id", kNone)->IsKey(kNone));
   EXPECT_FALSE(cls->GetPropertyDecl("Name", kNone)->IsKey(kNone));
   EXPECT_TRUE(cls->GetPropertyDecl("Name", kNone)->GetDefaultValue(kNone).IsNull());
@@ -51,7 +51,7 @@ TEST_F(TMemoryClassBuilderTest, DescribesReferencesToClassesOneselfIncluded) {
 
 TEST_F(TMemoryClassBuilderTest, DescribesStaticProperties) {
   auto const cls = ns_->DefineClass("X_Disk").Static("Count", "uint16", 3).Class();
-  auto const count = All<ICIMClass>(*cls, &ICIMClass::EnumerateStaticProperties).front();
+  auto const count = All(*cls, &ICIMClass::EnumerateStaticProperties).front();
   EXPECT_EQ(count->GetName(kNone), "Count");
   EXPECT_EQ(count->GetValue(kNone).GetType(), TType::kCIMTypeUint16);
   EXPECT_EQ(count->GetValue(kNone).ToString(), "3");
@@ -65,8 +65,8 @@ TEST_F(TMemoryClassBuilderTest, DescribesMethodsAndTheirParameters) {
                        .Out("Log", "string[8]")
                        .Method("Eject", "boolean")
                        .Class();
-  EXPECT_THAT(Names<ICIMClass>(*cls, &ICIMClass::EnumerateMethodDecls), ElementsAre("Reset", "Eject"));
-  auto const methods = All<ICIMClass>(*cls, &ICIMClass::EnumerateMethodDecls);
+  EXPECT_THAT(Names(*cls, &ICIMClass::EnumerateMethodDecls), ElementsAre("Reset", "Eject"));
+  auto const methods = All(*cls, &ICIMClass::EnumerateMethodDecls);
   auto const parameters = All(*methods[0], &ICIMMethodDecl::EnumerateParameterDecls);
   ASSERT_THAT(Names(*methods[0], &ICIMMethodDecl::EnumerateParameterDecls), ElementsAre("Force", "Log"));
   EXPECT_EQ(methods[0]->GetReturnType(kNone), TType::kCIMTypeUint32);
@@ -94,7 +94,7 @@ TEST_F(TMemoryClassBuilderTest, QualifierIsWrittenOnWhatWasDescribedLast) {
                        .In("Force", "boolean")
                        .Description("At once.")
                        .Class();
-  auto const reset = All<ICIMClass>(*cls, &ICIMClass::EnumerateMethodDecls).front();
+  auto const reset = All(*cls, &ICIMClass::EnumerateMethodDecls).front();
   EXPECT_EQ(Qualifiers(*cls), "Abstract(true) Description(A disk.)");
   EXPECT_EQ(Qualifiers(*cls->GetPropertyDecl("State", kNone)), "Override(state) ValueMap({ 0, 1 }) Values({ Unknown, Ready })");
   EXPECT_EQ(Qualifiers(*cls->GetPropertyDecl("Count", kNone)), "Static(true) Description(How many.)");

@@ -22,8 +22,8 @@ protected:
 };
 
 TEST_F(TMemoryInstanceTest, PropertiesComeFromTheTopClassDownAndOverridesInTheirFirstPlace) {
-  EXPECT_THAT(Names<ICIMInstance>(*disk_, &ICIMInstance::EnumerateProperties), ElementsAre("Id", "name", "Sizes", "Tail"));
-  EXPECT_EQ(VisitsUntilSecond<ICIMInstance>(*disk_, &ICIMInstance::EnumerateProperties), 2);
+  EXPECT_THAT(Names(*disk_, &ICIMInstance::EnumerateProperties), ElementsAre("Id", "name", "Sizes", "Tail"));
+  EXPECT_EQ(VisitsUntilSecond(*disk_, &ICIMInstance::EnumerateProperties), 2);
   auto const ssd = ns_->GetClass("X_Ssd", kNone)->CreateInstance(kNone);
   EXPECT_THAT(Names(*ssd, &ICIMInstance::EnumerateProperties), ElementsAre("Id", "name", "Sizes", "Tail", "Cells", "Letter"));
 }
@@ -41,7 +41,7 @@ TEST_F(TMemoryInstanceTest, PropertyTakesItsDeclaredTypeOnly) {
   id->SetValue(5u, kNone);
   TCIMValue const refused[] = {TCIMValue(5), TCIMValue("5"), TCIMValue(), NullOf("sint32"), NullOf("uint32[]")};
   for (TCIMValue const& value : refused) {
-    SCOPED_TRACE(value.GetType());
+    SCOPED_TRACE(static_cast<int>(value.GetType()));
     EXPECT_STATUS(id->SetValue(value, kNone), kZEPStatusTypeMismatch);
   }
   EXPECT_EQ(id->GetValue(kNone).ToString(), "5");

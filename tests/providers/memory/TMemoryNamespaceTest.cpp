@@ -71,7 +71,7 @@ TEST(TMemoryNamespaceTest, NamespaceEnumeratesRootClassesInTheOrderOfCreation) {
   ns->CreateClass(z, "Below", kNone);
   ns->CreateClass(nullptr, "M", kNone);
   EXPECT_THAT(ClassNames(*ns), ElementsAre("Z", "A", "M"));
-  EXPECT_EQ(VisitsUntilSecond<ICIMNamespace>(*ns, &ICIMNamespace::EnumerateClasses), 2);
+  EXPECT_EQ(VisitsUntilSecond(*ns, &ICIMNamespace::EnumerateClasses), 2);
 }
 
 // Classes at every level down to the ninth, two or three below each on the way, created level by level.
@@ -97,8 +97,9 @@ TEST(TMemoryNamespaceTest, RootClassesAndTheirSubclassesAreEveryClassOnceSupercl
   std::set<std::string> visited;
   auto const visit = [&](boost::shared_ptr<ICIMClass> const& cls) {
     EXPECT_TRUE(visited.insert(cls->GetName(kNone)).second) << cls->GetName(kNone) << " came twice";
-    if (!cls->IsRootClass(kNone))
+    if (!cls->IsRootClass(kNone)) {
       EXPECT_TRUE(visited.count(cls->GetSuperClass(kNone)->GetName(kNone))) << cls->GetName(kNone) << " came first";
+    }
     return true;
   };
   ns->EnumerateClasses(
@@ -138,7 +139,7 @@ TEST(TMemoryNamespaceTest, QualifierDeclarationsAreEnumeratedInTheOrderOfCreatio
   ns->CreateQualifierDecl("Zeta", NullOf("string"), ICIMQualifierDecl::kScopeAny, 0, kNone);
   auto const alpha = ns->CreateQualifierDecl("Alpha", NullOf("boolean"), ICIMQualifierDecl::kScopeAny, 0, kNone);
   EXPECT_THAT(Names(*ns, &ICIMNamespace::EnumerateQualifierDecls), ElementsAre("Zeta", "Alpha"));
-  EXPECT_EQ(VisitsUntilSecond<ICIMNamespace>(*ns, &ICIMNamespace::EnumerateQualifierDecls), 2);
+  EXPECT_EQ(VisitsUntilSecond(*ns, &ICIMNamespace::EnumerateQualifierDecls), 2);
   EXPECT_EQ(ns->GetQualifierDecl("ALPHA", kNone), alpha);
   EXPECT_STATUS(ns->GetQualifierDecl("Beta", kNone), kZEPStatusNotFound);
 }
@@ -182,7 +183,7 @@ protected:
   }
 
   boost::shared_ptr<TMemoryNamespace> const ns_ = NewNamespace();
-  boost::shared_ptr<ICIMInstance> disk_, device_;
+  boost::shared_ptr<TMemoryInstance> disk_, device_;
 };
 
 TEST_F(TMemoryNamespacePathTest, InstanceIsFoundUnderItsOwnClassAndAllItsKeys) {
@@ -297,7 +298,7 @@ TEST_F(TMemoryNamespacePathTest, DatetimesOfOneInstantInTwoZonesAreTwoKeys) {
 
 TEST_F(TMemoryNamespacePathTest, ReferenceKeyIsComparedByItsNamesInAnyCase) {
   ns_->DefineClass("X_Uses").Association().KeyReference("What", "X_Device");
-  auto const uses = ns_->AddInstance("X_Uses", {{"What", disk_->GetPath(kNone)}});
+  auto const uses = ns_->AddInstance("X_Uses", {{"What", disk_->GetReference()}});
 
   TCIMReference what(ns_, "ns:x_disk.ID=\"5\",BUS=\"sata\"", kNone);
   TCIMReference path(ns_, "X_Uses", kNone);
@@ -364,12 +365,12 @@ TEST(TMemoryNamespaceTest, StandardQualifiersAreDeclaredOnceAndLeaveOthersAlone)
   auto const ns = NewNamespace();
   auto const own = ns->CreateQualifierDecl("DESCRIPTION", TCIMValue("mine"), 0, 0, kNone);
   ns->DeclareStandardQualifiers();
-  auto const names = Names<ICIMNamespace>(*ns, &ICIMNamespace::EnumerateQualifierDecls);
+  auto const names = Names(*ns, &ICIMNamespace::EnumerateQualifierDecls);
   EXPECT_EQ(ns->GetQualifierDecl("Description", kNone), own);
 
   ns->DeclareStandardQualifiers();
   ns->DefineClass("X_Disk");
-  EXPECT_EQ(Names<ICIMNamespace>(*ns, &ICIMNamespace::EnumerateQualifierDecls), names);
+  EXPECT_EQ(Names(*ns, &ICIMNamespace::EnumerateQualifierDecls), names);
 }
 
 // ---- Life time ----
@@ -423,12 +424,12 @@ TEST_F(TMemoryNamespaceLifeTest, CirclesOfReferencesAreFreedToo) {
   EXPECT_TRUE(cls.expired());
 }
 
-TEST_F(TMemoryNamespaceLifeTest, WhatOutlivesTheNamespaceFindsItNoMore) {
+TEST_F(TMemoryNamespaceLifeTest, ClassThatOutlivesItsNamespaceIsEmpty) {
   auto const leaf = ns_->GetClass("X_Leaf", kNone);
   auto const method = All(*leaf, &ICIMClass::EnumerateMethodDecls).front();
   auto const parameter = All(*method, &ICIMMethodDecl::EnumerateParameterDecls).front();
   auto const declaration = class_->GetPropertyDecl("Id", kNone);
-  node_->Set("Next", node_->GetReference());
+  node_.reset();
   class_.reset();
   ns_.reset();
 
@@ -436,17 +437,22 @@ TEST_F(TMemoryNamespaceLifeTest, WhatOutlivesTheNamespaceFindsItNoMore) {
   EXPECT_FALSE(leaf->IsRootClass(kNone));
   EXPECT_THROW(leaf->GetNamespace(kNone), boost::bad_weak_ptr);
   EXPECT_THROW(leaf->GetSuperClass(kNone), boost::bad_weak_ptr);
+  EXPECT_THROW(leaf->GetPropertyDecl("Id", kNone), boost::bad_weak_ptr);
   EXPECT_THAT(Names(*leaf, &ICIMClass::EnumerateMethodDecls), IsEmpty());
 
-  EXPECT_THROW(node_->GetClass(kNone), boost::bad_weak_ptr);
-  EXPECT_THROW(node_->GetPath(kNone), boost::bad_weak_ptr);
-  EXPECT_EQ(node_->Get("Id").ToString(), "1");
-  EXPECT_TRUE(node_->Get("Next").IsNull());
-
-  EXPECT_EQ(declaration->GetName(kNone), "Id");
-  EXPECT_TRUE(declaration->GetOwner(kNone).expired());
   EXPECT_EQ(method->GetOwner(kNone).lock(), leaf);
   EXPECT_EQ(parameter->GetMethod(kNone).lock(), method);
+  EXPECT_EQ(declaration->GetName(kNone), "Id");
+  EXPECT_TRUE(declaration->GetOwner(kNone).expired());
+}
+
+TEST_F(TMemoryNamespaceLifeTest, InstanceThatOutlivesItsNamespaceKeepsItsValuesButForReferences) {
+  node_->Set("Next", node_->GetReference());
+  class_.reset();
+  ns_.reset();
+  EXPECT_EQ(node_->Get("Id").ToString(), "1");
+  EXPECT_TRUE(node_->Get("Next").IsNull());
+  EXPECT_THROW(node_->GetPath(kNone), boost::bad_weak_ptr);
 }
 
 TEST_F(TMemoryNamespaceLifeTest, NamespaceMayGoWhileItIsEnumerated) {

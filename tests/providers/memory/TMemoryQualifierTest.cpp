@@ -51,7 +51,7 @@ protected:
 };
 
 INSTANTIATE_TEST_SUITE_P(Elements, TMemoryQualifierTest, testing::Values("class", "property", "method", "parameter"),
-                         [](auto const& info) { return std::string(info.param); });
+                         [](auto const& test) { return std::string(test.param); });
 
 TEST_P(TMemoryQualifierTest, QualifierTellsWhatItWasAddedWith) {
   auto const qualifier = element_->AddQualifier(units_, "bytes", ICIMQualifierDecl::kFlavorToSubclass, kNone);
