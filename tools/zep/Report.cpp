@@ -81,7 +81,7 @@ TAnswer AskForModel(TNamespaceView const& view, TQuestion const& question) {
 }
 
 TMissing WhyNobodyAnswers(std::vector<TPlugIn> const& plugIns) {
-  if (plugIns.empty()) return {kMissingNotDescribed, "there is no provider plug-in in " + PlugInDirectory()};
+  if (plugIns.empty()) return {kMissingNotDescribed, "no provider plug-in found"};
   return {kMissingNotDescribed, "no provider plug-in works"};
 }
 
