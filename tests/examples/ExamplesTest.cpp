@@ -8,6 +8,8 @@
 
 #include <cstdio>
 #include <memory>
+#include <regex>
+#include <sstream>
 
 namespace NQRVZEP20 {
 namespace {
