@@ -37,11 +37,17 @@ if(ZEP_SANITIZE)
   add_link_options(-fsanitize=${ZEP_SANITIZE})
 endif()
 
+if(ZEP_BUILD_FUZZ)
+  # So that the fuzzer sees which branches of the library an input takes, not only those of the target itself.
+  target_compile_options(zep_options INTERFACE -fsanitize=fuzzer-no-link)
+endif()
+
 # A room of libzepcore.so. It sees the public headers and, as "room/Header.h", the private ones; which rooms it may
 # name there is checked by tests/house.
 function(zep_room name)
   add_library(${name} OBJECT ${ARGN})
   target_link_libraries(${name} PRIVATE zep_options)
+  target_compile_options(${name} PRIVATE -fno-semantic-interposition)  # exported functions may be inlined within the library
   target_include_directories(${name} PRIVATE ${PROJECT_SOURCE_DIR}/include ${PROJECT_SOURCE_DIR})
 endfunction()
 

@@ -4,8 +4,10 @@
 #include "os/MachineIdentity.h"
 #include "os/SmbiosLibrary.h"
 
-#include <algorithm>
+#include <memory>
 #include <new>
+#include <optional>
+#include <string_view>
 
 namespace NQRVZEP20 {
 namespace {

@@ -1,6 +1,7 @@
 #include "TCommUtil.h"
 #include "TOSSpecific.h"
 #include "tests/Support.h"
+#include "tests/os/FakeClock.h"
 
 #include <time.h>
 
@@ -115,6 +116,55 @@ TEST(GetLocalTimeTest, OffsetInZonesThatNeverOrAlwaysSaveDaylight) {
     TEnvironmentGuard const zone("TZ", row.text);
     EXPECT_EQ(TOSSpecific::GetLocalTime().GetUTCOffset(), row.standardOffset);
   }
+}
+
+TEST(GetLocalTimeTest, FollowsTheZoneThroughTheYear) {
+  struct TRow {
+    char const* zone;
+    TFakeClock::TTime time;
+    char const* text;
+  };
+  TRow const rows[] = {
+      {"UTC0", {2024, 2, 29, 23, 59, 59}, "20240229235959.000000+000"},
+      {"XST-1", {2023, 12, 31, 23, 59, 59}, "20240101005959.000000+060"},
+      {"XST5", {2024, 1, 1, 4, 59, 59}, "20231231235959.000000-300"},
+      {"UTC0", {2096, 2, 29, 1, 2, 3}, "20960229010203.000000+000"},
+      {"Europe/Berlin", {2024, 1, 15, 12, 0, 0}, "20240115130000.000000+060"},
+      {"Europe/Berlin", {2024, 3, 31, 0, 59, 59}, "20240331015959.000000+060"},
+      {"Europe/Berlin", {2024, 3, 31, 1, 0, 0}, "20240331030000.000000+120"},
+      {"Europe/Berlin", {2024, 10, 27, 0, 59, 59}, "20241027025959.000000+120"},
+      {"Europe/Berlin", {2024, 10, 27, 1, 0, 0}, "20241027020000.000000+060"},
+      {"Europe/Berlin", {2050, 7, 15, 12, 0, 0}, "20500715140000.000000+120"},
+      {"America/New_York", {2024, 1, 15, 12, 0, 0}, "20240115070000.000000-300"},
+      {"America/New_York", {2024, 7, 15, 12, 0, 0}, "20240715080000.000000-240"},
+      {"America/St_Johns", {2024, 1, 15, 12, 0, 0}, "20240115083000.000000-210"},
+      {"America/St_Johns", {2024, 7, 15, 12, 0, 0}, "20240715093000.000000-150"},
+      {"America/Santiago", {2024, 1, 15, 12, 0, 0}, "20240115090000.000000-180"},
+      {"Asia/Kolkata", {2024, 7, 15, 12, 0, 0}, "20240715173000.000000+330"},
+      // Standard time itself changed here.
+      {"America/Caracas", {2015, 7, 15, 12, 0, 0}, "20150715073000.000000-270"},
+      {"America/Caracas", {2017, 7, 15, 12, 0, 0}, "20170715080000.000000-240"},
+      // Daylight saving that shifts by half an hour, or backwards in winter: 60 minutes all the same.
+      {"Australia/Lord_Howe", {2024, 1, 15, 12, 0, 0}, "20240115230000.000000+690"},
+      {"Australia/Lord_Howe", {2024, 7, 15, 12, 0, 0}, "20240715223000.000000+630"},
+      {"IST-1GMT0,M10.5.0,M3.5.0/1", {2024, 1, 15, 12, 0, 0}, "20240115120000.000000+120"},
+      {"IST-1GMT0,M10.5.0,M3.5.0/1", {2024, 7, 15, 12, 0, 0}, "20240715130000.000000+060"},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(testing::Message() << row.zone << " in month " << row.time.month << " of " << row.time.year);
+    TFakeClock const clock({row.time});
+    TEnvironmentGuard const zone("TZ", row.zone);
+    EXPECT_EQ(TOSSpecific::GetLocalTime().ToString(), row.text);
+    EXPECT_EQ(TOSSpecific::GetLocalTime().ToString(), row.text);
+  }
+}
+
+TEST(GetLocalTimeTest, FollowsAClockThatJumps) {
+  TFakeClock const clock({{2024, 7, 15, 12, 0, 0}, {2024, 7, 15, 12, 0, 1}, {2024, 7, 15, 12, 0, 0}, {2031, 1, 2, 3, 4, 5}});
+  EXPECT_EQ(TOSSpecific::GetLocalTime().ToString(), "20240715120000.000000+000");
+  EXPECT_EQ(TOSSpecific::GetLocalTime().ToString(), "20240715120001.000000+000");
+  EXPECT_EQ(TOSSpecific::GetLocalTime().ToString(), "20240715120000.000000+000");
+  EXPECT_EQ(TOSSpecific::GetLocalTime().ToString(), "20310102030405.000000+000");
 }
 
 TEST(GetLocalTimeTest, LooksAtTheZoneOnEachCall) {

@@ -188,8 +188,8 @@ testing::AssertionResult EveryTypeReadsAsAStream(std::string const& text) {
 
 TEST(TCIMValueTextTest, AGeneratedCorpusReadsAsAStreamReadsIt) {
   int count = 0;
-  for (char const* blanks : {"", " ", "\t\n\v\f\r ", "\xA0", "_"})
-    for (char const* sign : {"", "+", "-", "+-", "- "})
+  for (char const* blanks : {"", "\t\n\v\f\r ", "\xA0"})
+    for (char const* sign : {"", "+", "-", "+-"})
       for (char const* digits : {"",
                                  "0",
                                  "00",
@@ -229,11 +229,11 @@ TEST(TCIMValueTextTest, AGeneratedCorpusReadsAsAStreamReadsIt) {
         for (char const* fraction : {"", ".", ".5", ".0000000000000000000000000000000000000000000000000001", "..", ".5.5"})
           for (char const* exponent : {"", "e", "E5", "e+", "e-5", "e+38", "e-45", "e-46", "e308", "e309", "e-324", "e-325",
                                        "e99999999999999999999", "e-99999999999999999999", "e1e1", "e1.5", "p3"})
-            for (char const* tail : {"", " ", "x", "1", ",000"}) {
+            for (char const* tail : {"", "x", " 1"}) {
               ASSERT_TRUE(EveryTypeReadsAsAStream(std::string(blanks) + sign + digits + fraction + exponent + tail));
               ++count;
             }
-  EXPECT_GT(count, 400000);
+  EXPECT_GT(count, 100000);
 }
 
 std::string RandomText(std::mt19937_64& random, std::string const& alphabet, std::size_t longest) {
