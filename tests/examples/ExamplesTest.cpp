@@ -124,6 +124,10 @@ void ExpectBlocksFrom(std::string const& document, std::string const& language, 
   EXPECT_EQ(found, count);
 }
 
+TEST(DocumentationTest, ReadmeShowsTheCodeOfTheExample) {
+  ExpectBlocksFrom("README.md", "cpp", "examples/ReadmeExample.cpp", 1);
+}
+
 TEST(DocumentationTest, WalkThroughShowsTheCodeOfTheExample) {
   ExpectBlocksFrom("docs/writing-a-provider.md", "cpp", "examples/Clock/Clock.cpp", 6);
   ExpectBlocksFrom("docs/writing-a-provider.md", "cmake", "examples/Clock/CMakeLists.txt", 1);
