@@ -290,6 +290,13 @@ TEST_F(TMemoryNamespacePathTest, KeysOfEachKindAreFoundByValue) {
   }
 }
 
+TEST_F(TMemoryNamespacePathTest, Char16KeyIsNotFoundByAPathReadFromText) {
+  ns_->DefineClass("X_Drive").Key("Letter", "char16");
+  auto const drive = ns_->AddInstance("X_Drive", {{"Letter", TCIMChar16(67)}});
+  EXPECT_EQ(ns_->GetInstance(drive->GetPath(kNone), kNone), drive);
+  EXPECT_FALSE(Find("X_Drive.Letter=\"67\""));  // a char16 that is read from text is NULL
+}
+
 TEST_F(TMemoryNamespacePathTest, DatetimesOfOneInstantInTwoZonesAreTwoKeys) {
   ns_->DefineClass("X_Event").Key("Time", "datetime");
   ns_->AddInstance("X_Event", {{"Time", TCIMDateTime("20070315140000.000000+060")}});
