@@ -128,7 +128,7 @@ TEST_F(ReportTest, EachRowHasItsValueOrItsReason) {
       {"full", "Machine type", "1234"},
       {"full", "Model", "AB7"},
       {"full", "Serial number", "KQ12345"},
-      {"full", "System type", "Linux"},
+      {"full", "OS type", "Linux"},
       {"full", "zepcore version", TEST_VERSION},
       {"full", "zepcore build", TEST_BUILD_ID},
       {"full", "Manufacturer", "Example Works"},
@@ -482,7 +482,7 @@ TEST_F(ReportTest, TheFirstProviderThatKnowsAnswers) {
   EXPECT_EQ(run.status, 2);
   EXPECT_EQ(LinesOf(run.output)[0], "one: 1234AB7, type 1234, model AB7, serial number KQ12345");
   EXPECT_EQ(ValueRowsOf(run.output, "Identity")[0][2], "provider Test");
-  EXPECT_EQ(ValueIn(run.output, "System"), "unknown: no provider describes it");
+  EXPECT_EQ(ValueIn(run.output, "OS"), "unknown: no provider describes it");
 }
 
 TEST_F(ReportTest, TwoSystemsAreNotOneIdentity) {
