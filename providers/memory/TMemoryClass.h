@@ -52,8 +52,8 @@ public:
 
   // ---- Filling ----
 
-  // Creates an instance, sets the values and commits it. A value that is refused is named in the log, as an error, before
-  // the exception passes on.
+  // Creates an instance, sets the values and commits it. What is refused is named in the log, as an error, before the
+  // exception passes on.
   boost::shared_ptr<TMemoryInstance> AddInstance(TMemoryValues const& values);
 
   // ---- For the other classes of this library ----

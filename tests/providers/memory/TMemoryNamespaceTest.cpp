@@ -338,6 +338,7 @@ TEST(TMemoryNamespaceTest, RefusalIsNamedInTheLog) {
   auto const ns = NewNamespace();
   ns->DefineClass("X_Disk").Key("Id", "uint32");
   ns->AddInstance("X_Disk", {{"Id", 5}});
+  ns->DefineClass("X_Idea", "X_Disk").Abstract();
   struct {
     std::function<void()> action;
     EZEPStatusCode status;
@@ -347,6 +348,7 @@ TEST(TMemoryNamespaceTest, RefusalIsNamedInTheLog) {
       {[&] { ns->DefineClass("X-Disk"); }, kZEPStatusInvalidCIMName, "X-Disk refused: kZEPStatusInvalidCIMName"},
       {[&] { ns->DefineClass("X_Ssd", "X_Disc"); }, kZEPStatusNotFound, "X_Ssd refused: kZEPStatusNotFound"},
       {[&] { ns->AddInstance("X_Disc", {}); }, kZEPStatusNotFound, "X_Disc refused: kZEPStatusNotFound"},
+      {[&] { ns->AddInstance("X_Idea", {}); }, kZEPStatusInvalidClass, "X_Idea refused: kZEPStatusInvalidClass"},
       {[&] {
          ns->AddInstance("X_Disk", {{"Name", "a"}});
        },
