@@ -1,1 +1,204 @@
 #include "TOSSpecific.h"
+#include "TZEPStatusCode.h"
+#include "core/Log.h"
+#include "os/MachineIdentity.h"
+#include "os/SmbiosLibrary.h"
+
+#include <algorithm>
+#include <new>
+
+namespace NQRVZEP20 {
+namespace {
+
+constexpr int kSystemInformation = 1;  // SMBIOS type 1 and its string fields
+constexpr std::size_t kProductName = 5;
+constexpr std::size_t kSerialNumber = 7;
+
+constexpr int kBiosInformation = 0;  // SMBIOS type 0
+constexpr std::size_t kBiosVersion = 5;
+constexpr int kBiosStringArea = 100;  // bytes of its string set that are looked at
+
+constexpr char const* kNoBiosID = "00";
+
+// Null when there is no memory.
+std::unique_ptr<char[]> NewClearedBuffer(int size) {
+  return std::unique_ptr<char[]>(new (std::nothrow) char[static_cast<std::size_t>(size)]());
+}
+
+void LogIdentity(std::string const& productDescription, TMachineIdentity const& identity) {
+  LogDebug("GetMachineInfo productDesc");
+  LogDebug(productDescription);
+  LogDebug("GetMachineInfo machineName");
+  LogDebug(identity.name);
+  LogDebug("GetMachineInfo machineType");
+  LogDebug(identity.type);
+  LogDebug("GetMachineInfo machineModel");
+  LogDebug(identity.model);
+}
+
+enum class EIdentityLog { kTypeOnly, kAll };
+
+// Reads SMBIOS type 1, for GetMachineType and GetMachineInfo alike: the messages of both name the former.
+TMachineIdentity ReadMachineIdentity(EIdentityLog logged) {
+  TMachineIdentity identity;
+  TSmbiosTables tables;
+  if (tables.OpenStatus() != kZEPStatusOK) {
+    LogDebug("getMachineType: Unable to open SMBIOS lib error = ", tables.OpenStatus());
+    return identity;
+  }
+  if (!tables.HasHandle()) {
+    LogDebug("Unable to read machine type from SMBIOS. Invalid Handle was encountered.");
+    return identity;
+  }
+  constexpr int kBufferSize = 1024;
+  const std::unique_ptr<char[]> buffer = NewClearedBuffer(kBufferSize);
+  if (!buffer) {
+    LogDebug("Unable to allocate memory to hold machineType");
+    return identity;
+  }
+  int length = 0;
+  if (tables.GetFirst(kSystemInformation, buffer.get(), kBufferSize, length) != kZEPStatusOK || length < 1) {
+    LogDebug("Unable to read DMI structure type 1 from SMBIOS");
+    return identity;
+  }
+
+  const TStructureStrings strings({buffer.get(), static_cast<std::size_t>(length)});
+  const std::string productDescription = strings.NamedAt(kProductName).value_or("");
+  ReadProductDescription(productDescription, identity);
+  if (logged == EIdentityLog::kAll) LogIdentity(productDescription, identity);
+  identity.serialNumber = strings.NamedAt(kSerialNumber).value_or(identity.serialNumber);
+
+  LogDebug("Machine type detected: ", identity.type);
+  tables.Close();
+  LogDebug("getMachineType() completed.");
+  return identity;
+}
+
+// What the readers of the BIOS version log.
+struct TBiosVersionMessages {
+  std::string_view unableToOpen, retrieving, readFailed, noMoreItems;
+};
+
+constexpr TBiosVersionMessages kGetBiosIDMessages = {
+    "GetBiosID: Unable to open SMBIOS lib error = ",
+    "TOSSpecific::GetBiosID - Retrieving first SMBIOS structure",
+    "TOSSpecific::GetBiosID - smbios read operation failed! ",
+    "TOSSpecific::GetBiosID - read all smbios structures available for type 0",
+};
+
+constexpr TBiosVersionMessages kGetMachineTypeFromIDMessages = {
+    "getBIOSstructure: Unable to open SMBIOS lib error = ",
+    "TOSSpecific::GetMachineTypeFromID - Retrieving first SMBIOS structure",
+    "TOSSpecific::GetMachineTypeFromID - smbios read operation failed! ",
+    "TOSSpecific::GetMachineTypeFromID - read all smbios structures available for type 0",
+};
+
+// The BIOS version in the structure of type 0 that the buffer holds; empty when it is not in the part looked at.
+std::string BiosVersionIn(char* buffer) {
+  char* const stringSet = buffer + static_cast<unsigned char>(buffer[1]);
+  char version[kBiosStringArea + 1] = {};
+  TOSSpecific::getBIDString(stringSet, version, kBiosStringArea, static_cast<unsigned char>(buffer[kBiosVersion]));
+  return CleanBiosVersion(version);
+}
+
+// The cleaned BIOS version of SMBIOS type 0, empty when the read failed. Nothing when the tables cannot be opened or hold
+// no such structure.
+std::optional<std::string> ReadBiosVersion(TSmbiosTables& tables, TBiosVersionMessages const& messages) {
+  constexpr int kBufferSize = 4096;
+  const std::unique_ptr<char[]> buffer = NewClearedBuffer(kBufferSize);
+  const int openStatus = buffer ? tables.OpenStatus() : kZEPStatusOutOfMemory;
+  if (openStatus != kZEPStatusOK) {
+    LogDebug(messages.unableToOpen, openStatus);
+    return std::nullopt;
+  }
+
+  LogDebug(messages.retrieving);
+  int length = 0;
+  const int status = tables.GetFirst(kBiosInformation, buffer.get(), kBufferSize, length);
+  if (status == kZEPStatusFail) {
+    LogDebug(messages.readFailed);
+    return std::string();
+  }
+  if (status == kZEPStatusNoMoreItems) {
+    LogDebug(messages.noMoreItems);
+    return std::nullopt;
+  }
+  return BiosVersionIn(buffer.get());
+}
+
+std::string LowerCase(std::string text) {
+  for (char& c : text)
+    if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
+  return text;
+}
+
+}  // namespace
+
+std::string TOSSpecific::GetMachineInfo(std::string key) {
+  LogDebug("getMachineInfo() entered.");
+  const TMachineIdentity identity = ReadMachineIdentity(EIdentityLog::kAll);
+  if (key == "type") return identity.type;
+  if (key == "name") return identity.name;
+  if (key == "model") return identity.model;
+  if (key == "SN") return identity.serialNumber;
+  return "error param of GetMachineInfo";
+}
+
+std::string TOSSpecific::GetMachineSN() { return GetMachineInfo("SN"); }
+
+std::string TOSSpecific::GetMachineModel() { return GetMachineInfo("model"); }
+
+std::string TOSSpecific::GetMachineName() { return GetMachineInfo("name"); }
+
+// The machine's name, not that of its operating system. Kept.
+std::string TOSSpecific::GetOperatingSystemName() { return GetMachineName(); }
+
+std::string TOSSpecific::GetMachineType() {
+  LogDebug("getMachineType() entered.");
+  return ReadMachineIdentity(EIdentityLog::kTypeOnly).type;
+}
+
+std::string TOSSpecific::GetMachineTypeFromID() {
+  const std::string type = GetMachineType();
+  TSmbiosTables tables;
+  if (const std::optional<std::string> version = ReadBiosVersion(tables, kGetMachineTypeFromIDMessages)) {
+    const std::string buildNumber = LowerCase(*version);
+    LogDebug("TOSSpecific::GetMachineTypeFromID - buildNumber is ", buildNumber);
+    if (const std::optional<std::string> typeOfBuild = MachineTypeOfBuild(buildNumber)) {
+      LogDebug("Get machineType from Bios ID().\nmachineType=", *typeOfBuild, "\tBios ID =", *version);
+      return *typeOfBuild;
+    }
+  }
+  LogDebug("Failed in getting machineType from Bios ID.\nGet machineType from GetMachineType().\nmachineType=", type);
+  return type;
+}
+
+std::string TOSSpecific::GetBiosID() {
+  TSmbiosTables tables;
+  const std::optional<std::string> version = ReadBiosVersion(tables, kGetBiosIDMessages);
+  if (!version) return kNoBiosID;
+  const std::string biosID = version->size() < 2 ? kNoBiosID : version->substr(0, 2);
+  LogDebug("TOSSpecific::GetBiosID - biosID = ", biosID);
+  return biosID;
+}
+
+int TOSSpecific::getBIDString(char* stringSet, char* output, int length, int number) {
+  if (length < 1) return 0;
+  std::string_view rest(stringSet, static_cast<std::size_t>(length));
+  // The empty string that closes the set is none of its strings, nor are zeros behind it.
+  const std::size_t last = rest.find_last_not_of('\0');
+  if (last == rest.npos) return 0;
+  rest = rest.substr(0, last + 2);
+  for (int n = 1; n <= number; ++n) {
+    const std::size_t end = rest.find('\0');
+    if (end == rest.npos) return 0;
+    if (n == number) {
+      rest.copy(output, n == 1 ? end : end + 1);
+      return 1;
+    }
+    rest.remove_prefix(end + 1);
+  }
+  return 0;
+}
+
+}  // namespace NQRVZEP20

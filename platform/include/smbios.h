@@ -2,26 +2,50 @@
 #define ZEP_PLATFORM_SMBIOS_H
 
 /*
- * The SMBIOS access library, libsmbios.so. The core loads it at run time by these three functions and never links it.
+ * The SMBIOS access library, libsmbios.so. The core loads it at run time by smBiosLoad, smBiosGetFirst and smBiosClose
+ * and never links it.
  *
- * Each returns a status of the core's list: 0 success, 3 failure (kZEPStatusFail), 5 no structure of that type
- * (kZEPStatusNoMoreItems). A handle is used by one thread at a time; any number may be open.
+ * The tables are those the kernel exports (/sys/firmware/dmi/tables/DMI, which only root may read), or those in the file
+ * that the environment variable ZEP_SMBIOS_TABLE names: a bare DMI table, or what `dmidecode --dump-bin` writes. The
+ * variable is looked at by each smBiosLoad. A table ends at its end-of-table structure (type 127), or in front of the
+ * first structure that is not whole; no more than the first 16 MiB of a file are looked at.
+ *
+ * A handle holds a copy of the tables and is used by one thread at a time; any number may be open.
  */
 
 #ifdef __cplusplus
 extern "C" {
 #endif
 
-/* Opens the tables and hands out a handle, null on failure. `provider` is not looked at and may be null. */
+/* What the functions return: statuses of the core's list, under the core's numbers. */
+enum {
+  kSmbiosOk = 0,
+  kSmbiosFail = 3,          /* an argument that cannot be used; a file that cannot be read or holds no table */
+  kSmbiosOutOfMemory = 4,
+  kSmbiosNoMoreItems = 5,   /* there is no structure of that type, or no further one */
+  kSmbiosFileNotFound = 26, /* the kernel exports no tables, or the named file is not there */
+  kSmbiosAccessDenied = 27  /* this user may not read the tables */
+};
+
+/* Reads the tables and hands out a handle, null on failure. `provider` is not looked at and may be null. */
 int smBiosLoad(void* provider, void** handle);
 
 /*
  * Copies the first structure of that type, string set and its double zero included, into the caller's buffer. `length`:
- * in, the buffer's size in bytes; out, the structure's. A structure that does not fit is cut to the buffer.
+ * in, the buffer's size in bytes; out, the structure's. Of a structure that does not fit as much is copied as there is
+ * room for, and `length` comes back larger than it was; with a size of 0 the buffer may be null. On failure the buffer
+ * and `length` stay as they were.
  */
 int smBiosGetFirst(void* handle, int type, void* buffer, int* length);
 
-/* Releases the handle; null is allowed. */
+/*
+ * The same for the next structure of that type behind the one that smBiosGetFirst or smBiosGetNext copied last, whatever
+ * type that one had. On a fresh handle the search begins with the first structure. A search that finds nothing leaves
+ * the place where it was. The core does not use it, and a libsmbios.so without it will do.
+ */
+int smBiosGetNext(void* handle, int type, void* buffer, int* length);
+
+/* Releases the handle; null is allowed. Returns 0. */
 int smBiosClose(void* handle);
 
 #ifdef __cplusplus

@@ -93,8 +93,11 @@ TEST(AssertionHandlerTest, WritesNothingToTheLog) {
   EXPECT_TRUE(TRootObject::GetCoreLogger()->GetLog().empty());
 }
 
+// Not inline: a compiler that sees that the pointer is empty warns about its use.
+__attribute__((noinline)) boost::shared_ptr<ICIMClass> EmptyPointer() { return boost::shared_ptr<ICIMClass>(); }
+
 TEST(AssertionHandlerTest, AnEmptyPointerOfAPublicHeaderEndsInTheHandler) {
-  boost::shared_ptr<ICIMClass> const empty;
+  boost::shared_ptr<ICIMClass> const empty = EmptyPointer();
   {
     TEnvironmentGuard const mode(kMode, nullptr);
     EXPECT_STATUS(empty->GetName(TCIMContext()), kZEPStatusFail);

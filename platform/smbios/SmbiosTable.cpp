@@ -1,0 +1,95 @@
+#include "platform/smbios/SmbiosTable.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <numeric>
+
+namespace smbios {
+namespace {
+
+using namespace std::string_view_literals;
+
+constexpr std::size_t kHeaderSize = 4;
+
+std::size_t ByteAt(std::string_view bytes, std::size_t offset) { return static_cast<unsigned char>(bytes[offset]); }
+
+// `size` bytes, the least significant first.
+std::uint64_t NumberAt(std::string_view bytes, std::size_t offset, std::size_t size) {
+  std::uint64_t number = 0;
+  while (size-- > 0) number = number << 8 | ByteAt(bytes, offset + size);
+  return number;
+}
+
+// The whole structure that the bytes begin with, or none.
+TStructure FrontOf(std::string_view bytes) {
+  if (bytes.size() < kHeaderSize) return {};
+  const std::size_t formattedLength = ByteAt(bytes, 1);
+  if (formattedLength < kHeaderSize || formattedLength > bytes.size()) return {};
+  const std::size_t setEnd = bytes.find("\0\0"sv, formattedLength);
+  if (setEnd == bytes.npos) return {};
+  return bytes.substr(0, setEnd + 2);
+}
+
+bool StartsWith(std::string_view bytes, std::string_view start) { return bytes.substr(0, start.size()) == start; }
+
+// The bytes of a sound entry point add up to 0.
+bool IsSumZero(std::string_view bytes) {
+  return std::accumulate(bytes.begin(), bytes.end(), 0u,
+                         [](unsigned sum, char byte) { return (sum + static_cast<unsigned char>(byte)) & 0xFFu; }) == 0;
+}
+
+// Where an entry point keeps what is needed of it. All of it lies within `minLength` bytes.
+struct TEntryPointLayout {
+  std::string_view anchor;
+  std::size_t minLength, maxLength;  // what the length byte may say
+  std::size_t lengthOffset;
+  std::size_t tableSizeOffset, tableSizeBytes;
+  std::size_t tableAddressOffset, tableAddressBytes;
+  bool hasInnerPart;  // with an anchor and a checksum of its own
+};
+
+// The length 0x1E is a known slip for 0x1F.
+constexpr TEntryPointLayout kEntryPoint32 = {"_SM_"sv, 0x1E, 0x20, 5, 0x16, 2, 0x18, 4, true};
+constexpr TEntryPointLayout kEntryPoint64 = {"_SM3_"sv, 0x18, 0x20, 6, 0x0C, 4, 0x10, 8, false};
+
+bool IsInnerPartSound(std::string_view entryPoint) {
+  const std::string_view inner = entryPoint.substr(0x10, 0x0F);
+  return StartsWith(inner, "_DMI_"sv) && IsSumZero(inner);
+}
+
+std::string_view TableNamedBy(TEntryPointLayout const& layout, std::string_view file) {
+  if (file.size() < layout.maxLength) return {};  // no room for a table behind it
+  const std::size_t length = ByteAt(file, layout.lengthOffset);
+  if (length < layout.minLength || length > layout.maxLength) return {};
+  if (!IsSumZero(file.substr(0, length))) return {};
+  if (layout.hasInnerPart && !IsInnerPartSound(file)) return {};
+
+  const std::uint64_t address = NumberAt(file, layout.tableAddressOffset, layout.tableAddressBytes);
+  if (address < length || address > file.size()) return {};
+  return file.substr(address, NumberAt(file, layout.tableSizeOffset, layout.tableSizeBytes));
+}
+
+}  // namespace
+
+int TypeOf(TStructure structure) { return static_cast<int>(ByteAt(structure, 0)); }
+
+TStructure TStructureReader::Next() {
+  const TStructure structure = FrontOf(fRest);
+  fRest.remove_prefix(structure.size());
+  if (structure.empty() || TypeOf(structure) == kEndOfTableType) fRest = {};
+  return structure;
+}
+
+TStructure TStructureReader::NextOfType(int type) {
+  TStructure structure = Next();
+  while (!structure.empty() && TypeOf(structure) != type) structure = Next();
+  return structure;
+}
+
+std::string_view DmiTableIn(std::string_view file) {
+  if (StartsWith(file, kEntryPoint64.anchor)) return TableNamedBy(kEntryPoint64, file);
+  if (StartsWith(file, kEntryPoint32.anchor)) return TableNamedBy(kEntryPoint32, file);
+  return file;
+}
+
+}  // namespace smbios

@@ -1,0 +1,22 @@
+// Prints where the library lies, the host provider's class of the system, and what an empty pointer ends in.
+
+#include <zepcore.h>
+
+#include <iostream>
+
+using namespace NQRVZEP20;
+
+int main() {
+  std::cout << TOSSpecific::GetZEPRootPath() << "\n";
+  TOSSpecific::LoadNSPLibrary("Host");
+  boost::shared_ptr<ICIMNamespace> const ns =
+      TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Host")->GetNamespace(TCIMContext());
+  std::cout << ns->GetClass("QRVSG_ComputerSystem", TCIMContext())->GetName(TCIMContext()) << "\n";
+  try {
+    boost::shared_ptr<ICIMNamespace> nothing(ns);
+    nothing.reset();
+    nothing->GetName(TCIMContext());
+  } catch (TZEPException const& thrown) {
+    std::cout << thrown.what() << "\n";
+  }
+}

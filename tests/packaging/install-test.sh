@@ -1,0 +1,40 @@
+#!/usr/bin/env bash
+# Installs the build tree given into a fresh prefix and uses it there as a stranger would: runs zep, and builds the consumer
+# with CMake and with pkg-config.
+#
+#   install-test.sh BUILD_DIR CXX
+set -euo pipefail
+build=$1 cxx=$2
+here=$(cd "$(dirname "$0")" && pwd)
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+cmake --install "$build" --prefix "$work/prefix" >"$work/install.log"
+
+private=$(dirname "$(find "$work/prefix" -name libzepcore.so)")
+for file in libsmbios.so libHost.nsp.so; do
+  [[ -e $private/$file ]] || { echo "$file does not lie beside libzepcore.so" >&2; exit 1; }
+done
+
+status=0
+"$work/prefix/bin/zep" report --sample >"$work/report" || status=$?
+[[ $status == 0 || $status == 2 ]] || { echo "the installed zep ended with $status" >&2; exit 1; }
+grep -q SAMPLE "$work/report"
+
+expected=$(printf '%s\nQRVSG_ComputerSystem\nkZEPStatusFail' "$private")
+check() {  # check NAME PROGRAM
+  local printed
+  printed=$("$2" 2>/dev/null)
+  [[ $printed == "$expected" ]] || { printf '%s printed:\n%s\ninstead of:\n%s\n' "$1" "$printed" "$expected" >&2; exit 1; }
+}
+
+cmake -S "$here/consumer" -B "$work/cmake" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/cmake.log"
+cmake --build "$work/cmake" >>"$work/cmake.log" || { cat "$work/cmake.log" >&2; exit 1; }
+check "the consumer built with CMake" "$work/cmake/consumer"
+
+export PKG_CONFIG_PATH
+PKG_CONFIG_PATH=$(dirname "$(find "$work/prefix" -name zepcore.pc)")
+# The file names the prefix it was configured for; this one lies elsewhere.
+read -ra flags <<<"$(pkg-config --define-variable=prefix="$work/prefix" --cflags --libs zepcore)"
+"$cxx" -std=c++17 "$here/consumer/main.cpp" -o "$work/consumer" "${flags[@]}"
+check "the consumer built with pkg-config" "$work/consumer"
+echo "the installed tree works"
