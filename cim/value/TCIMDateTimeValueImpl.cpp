@@ -12,12 +12,12 @@ std::string TCIMDateTimeValueImpl::ToString(unsigned char) const { return fDateT
 
 bool TCIMDateTimeValueImpl::operator==(TCIMValue const& other) const {
   if (other.GetType() != TCIMValue::TCIMType::kCIMTypeDateTime) return false;
-  return fDateTime == static_cast<TCIMDateTime>(other);
+  return fDateTime == DataOf<TCIMDateTimeValueImpl>(other).fDateTime;
 }
 
 bool TCIMDateTimeValueImpl::operator<(TCIMValue const& other) const {
   if (other.GetType() != TCIMValue::TCIMType::kCIMTypeDateTime) return false;
-  return fDateTime < static_cast<TCIMDateTime>(other);
+  return fDateTime < DataOf<TCIMDateTimeValueImpl>(other).fDateTime;
 }
 
 }  // namespace NQRVZEP20

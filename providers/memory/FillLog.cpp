@@ -1,0 +1,13 @@
+#include "providers/memory/FillLog.h"
+
+#include "ILogger.h"
+#include "TRootObject.h"
+
+namespace NQRVZEP20 {
+
+void LogRefusal(std::string const& className, std::string const& member, TZEPException const& reason) {
+  const std::string what = member.empty() ? className : className + "." + member;
+  TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, what + " refused: " + reason.what());
+}
+
+}  // namespace NQRVZEP20

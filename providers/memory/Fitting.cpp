@@ -1,0 +1,39 @@
+#include "providers/memory/Fitting.h"
+
+#include "ICIMNamespace.h"
+#include "providers/memory/CIMTypes.h"
+
+namespace NQRVZEP20 {
+
+namespace {
+
+bool IsInteger(TCIMValue::TCIMType type) {
+  return type >= TCIMValue::TCIMType::kCIMTypeUint8 && type <= TCIMValue::TCIMType::kCIMTypeSint64;
+}
+
+TCIMValue NullLike(TCIMValue const& pattern) {
+  TCIMValue null(pattern);
+  null.SetNullValue(pattern.GetType(), pattern.GetMaxArraySize());
+  return null;
+}
+
+TCIMValue WithBoundOf(TCIMValue const& pattern, TCIMValue const& array) {
+  if (array.IsNull()) return NullLike(pattern);
+  const std::vector<TCIMValue>& elements = array;
+  return TCIMValue(BaseTypeOf(array.GetType()), pattern.GetMaxArraySize(), elements);
+}
+
+}  // namespace
+
+TCIMValue FittedTo(TCIMValue const& pattern, TCIMValue const& value) {
+  const TCIMValue::TCIMType type = pattern.GetType();
+  if (value.GetType() == type) return value.IsArray() ? WithBoundOf(pattern, value) : value;
+  if (value.GetType() == TCIMValue::TCIMType::kCIMTypeInvalid) return NullLike(pattern);
+  if (value.IsNull() || !IsInteger(type) || !IsInteger(value.GetType())) return value;
+
+  std::string digits = value.ToString();
+  const TCIMValue converted(type, digits, boost::shared_ptr<ICIMNamespace>());
+  return converted.ToString() == digits ? converted : value;  // a number out of range reads back as another one
+}
+
+}  // namespace NQRVZEP20

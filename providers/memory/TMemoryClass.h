@@ -1,0 +1,99 @@
+#pragma once
+
+#include "ICIMClass.h"
+#include "providers/memory/TMemoryInstance.h"
+#include "providers/memory/TMemoryMethodDecl.h"
+#include "providers/memory/TMemoryNamedElement.h"
+#include "providers/memory/TMemoryPropertyDecl.h"
+
+#include <string>
+#include <unordered_map>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+class TMemoryNamespace;
+
+// A class. Made by TMemoryNamespace, which owns it; a class that outlives its namespace is empty.
+//
+// Beyond what the interfaces say: names that are no CIM names are refused with kZEPStatusInvalidCIMName, and a class and
+// its superclasses take no more property declarations, and no more Key qualifiers, once CreateInstance was called.
+class TMemoryClass : public TMemoryNamedElement<ICIMClass> {
+public:
+  TMemoryClass(boost::weak_ptr<TMemoryNamespace> ns, boost::shared_ptr<TMemoryClass> superClass, std::string const& name);
+
+  boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) const override;
+  bool GetClassFlag(TCIMContext const& context) const override;
+  bool IsAbstract(TCIMContext const& context) const override;
+  bool IsRootClass(TCIMContext const& context) const override;
+  boost::shared_ptr<ICIMClass> GetSuperClass(TCIMContext const& context) const override;
+  void EnumerateSubClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)> callback,
+                           TCIMContext const& context) const override;
+
+  void BeginDeclarations(TCIMContext const& context) override;
+  void EndDeclarations(TCIMContext const& context) override;
+  boost::shared_ptr<ICIMPropertyDecl> AddPropertyDecl(std::string const& name, TCIMValue const& defaultValue,
+                                                      TCIMContext const& context) override;
+  boost::shared_ptr<ICIMPropertyDecl const> GetPropertyDecl(std::string const& name, TCIMContext const& context) const override;
+  void EnumeratePropertyDecls(boost::function<bool(boost::shared_ptr<ICIMPropertyDecl>)> callback,
+                              TCIMContext const& context) const override;
+
+  void SetStaticProperty(std::string const& name, TCIMValue const& value, TCIMContext const& context) override;
+  void EnumerateStaticProperties(boost::function<bool(boost::shared_ptr<ICIMProperty>)> callback,
+                                 TCIMContext const& context) const override;
+
+  boost::shared_ptr<ICIMInstance> CreateInstance(TCIMContext const& context) override;
+  void EnumerateInstances(boost::function<bool(boost::shared_ptr<ICIMInstance>)> callback,
+                          TCIMContext const& context) const override;
+
+  boost::shared_ptr<ICIMMethodDecl> AddMethodDecl(std::string const& name, TCIMValue::TCIMType returnType,
+                                                  TCIMContext const& context) override;
+  void EnumerateMethodDecls(boost::function<bool(boost::shared_ptr<ICIMMethodDecl>)> callback,
+                            TCIMContext const& context) const override;
+
+  void CommitInstance(boost::shared_ptr<ICIMInstance> instance, TCIMContext const& context) override;
+
+  // ---- Filling ----
+
+  // Creates an instance, sets the values and commits it. A value that is refused is named in the log, as an error, before
+  // the exception passes on.
+  boost::shared_ptr<TMemoryInstance> AddInstance(TMemoryValues const& values);
+
+  // ---- For the other classes of this library ----
+
+  boost::shared_ptr<TMemoryClass> SuperClass() const;  // empty for a root class
+
+  // The declaration in this class or the nearest in its superclasses; empty when there is none.
+  boost::shared_ptr<TMemoryPropertyDecl> FindPropertyDecl(std::string const& name) const;
+
+  bool HasMadeInstances() const { return fLayout != nullptr; }
+
+  // The instance of this class itself that was committed with the keys of the path; empty when there is none.
+  boost::shared_ptr<TMemoryInstance> FindInstance(TCIMReference const& path) const;
+
+  void AddSubClass(boost::shared_ptr<TMemoryClass> subClass) { fSubClasses.push_back(subClass); }
+
+  // Lets go of everything but the name. Values refer to classes as owners do, so that classes can own one another in
+  // circles; the namespace breaks these when it goes.
+  void Empty();
+
+private:
+  boost::shared_ptr<TMemoryClass> Self() { return boost::static_pointer_cast<TMemoryClass>(shared_from_this()); }
+  boost::shared_ptr<TMemoryLayout const> Layout();                     // made at the first call
+  std::vector<boost::shared_ptr<TMemoryClass>> AllSubClasses() const;  // in the order of EnumerateSubClasses
+
+  bool const fIsRoot;
+  bool fIsDeclaring = false;
+  boost::weak_ptr<TMemoryClass> fSuperClass;
+  std::vector<boost::shared_ptr<TMemoryClass>> fSubClasses;  // the direct ones
+
+  TNamedList<TMemoryPropertyDecl> fPropertyDecls;
+  TNamedList<TMemoryMethodDecl> fMethodDecls;
+  TNamedList<TMemoryProperty> fStaticProperties;
+
+  boost::shared_ptr<TMemoryLayout const> fLayout;  // empty until the class or a subclass makes its first instance
+  std::vector<boost::shared_ptr<TMemoryInstance>> fInstances;
+  std::unordered_map<std::string, boost::shared_ptr<TMemoryInstance>> fInstancesByKeys;  // those that have a key value
+};
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,108 @@
+#include "providers/memory/TMemoryClassBuilder.h"
+
+#include "providers/memory/FillLog.h"
+#include "providers/memory/Fitting.h"
+#include "providers/memory/TMemoryClass.h"
+
+namespace NQRVZEP20 {
+
+namespace {
+
+TCIMValue TextArray(std::vector<std::string> const& texts) {
+  return TCIMValue(TCIMValue::TCIMType::kCIMTypeString, 0, std::vector<TCIMValue>(texts.begin(), texts.end()));
+}
+
+// The default value of a property of that type.
+TCIMValue DefaultOf(TMemoryType const& type, TCIMValue const& value) {
+  const TCIMValue fitted = FittedTo(type.GetNull(), value);
+  if (fitted.GetType() != type.GetType()) throw TZEPException(kZEPStatusTypeMismatch);
+  return fitted;
+}
+
+TCIMValue NullReferenceTo(boost::shared_ptr<ICIMClass> cls) {
+  TCIMValue null = TMemoryType(TCIMValue::TCIMType::kCIMTypeReference).GetNull();
+  null.SetReferencedClass(cls);
+  return null;
+}
+
+}  // namespace
+
+TMemoryClassBuilder::TMemoryClassBuilder(boost::shared_ptr<TMemoryClass> cls) : fClass(cls), fElement(cls) {}
+
+TMemoryClassBuilder& TMemoryClassBuilder::Property(std::string const& name, TMemoryType const& type,
+                                                   TCIMValue const& defaultValue) {
+  NameRefusal(ClassName(), name, [&] { fElement = fClass->AddPropertyDecl(name, DefaultOf(type, defaultValue), TCIMContext()); });
+  return *this;
+}
+
+TMemoryClassBuilder& TMemoryClassBuilder::Key(std::string const& name, TMemoryType const& type) {
+  return Property(name, type).Qualifier("Key", true);
+}
+
+TMemoryClassBuilder& TMemoryClassBuilder::Reference(std::string const& name, std::string const& className) {
+  const TCIMContext none;
+  NameRefusal(ClassName(), name, [&] {
+    const boost::shared_ptr<ICIMClass> referenced = fClass->GetNamespace(none)->GetClass(className, none);
+    fElement = fClass->AddPropertyDecl(name, NullReferenceTo(referenced), none);
+  });
+  return *this;
+}
+
+TMemoryClassBuilder& TMemoryClassBuilder::KeyReference(std::string const& name, std::string const& className) {
+  return Reference(name, className).Qualifier("Key", true);
+}
+
+TMemoryClassBuilder& TMemoryClassBuilder::Static(std::string const& name, TMemoryType const& type, TCIMValue const& value) {
+  Property(name, type).Qualifier("Static", true);
+  NameRefusal(ClassName(), name, [&] { fClass->SetStaticProperty(name, DefaultOf(type, value), TCIMContext()); });
+  return *this;
+}
+
+TMemoryClassBuilder& TMemoryClassBuilder::Method(std::string const& name, TMemoryType const& returnType) {
+  NameRefusal(ClassName(), name, [&] { fMethod = fClass->AddMethodDecl(name, returnType.GetType(), TCIMContext()); });
+  fElement = fMethod;
+  return *this;
+}
+
+TMemoryClassBuilder& TMemoryClassBuilder::In(std::string const& name, TMemoryType const& type) {
+  return Parameter(name, type).Qualifier("In", true);
+}
+
+// A parameter is an input unless it says otherwise, as the declaration of In has it.
+TMemoryClassBuilder& TMemoryClassBuilder::Out(std::string const& name, TMemoryType const& type) {
+  return Parameter(name, type).Qualifier("In", false).Qualifier("Out", true);
+}
+
+TMemoryClassBuilder& TMemoryClassBuilder::Abstract() { return Qualifier("Abstract", true); }
+
+TMemoryClassBuilder& TMemoryClassBuilder::Association() { return Qualifier("Association", true); }
+
+TMemoryClassBuilder& TMemoryClassBuilder::Description(std::string const& text) { return Qualifier("Description", text); }
+
+TMemoryClassBuilder& TMemoryClassBuilder::Override() { return Qualifier("Override", fElement->GetName(TCIMContext())); }
+
+TMemoryClassBuilder& TMemoryClassBuilder::ValueMap(std::vector<std::string> const& values,
+                                                   std::vector<std::string> const& words) {
+  return Qualifier("ValueMap", TextArray(values)).Qualifier("Values", TextArray(words));
+}
+
+TMemoryClassBuilder& TMemoryClassBuilder::Qualifier(std::string const& name, TCIMValue const& value) {
+  const TCIMContext none;
+  NameRefusal(ClassName(), "[" + name + "]", [&] {
+    const boost::shared_ptr<ICIMQualifierDecl> decl = fClass->GetNamespace(none)->GetQualifierDecl(name, none);
+    fElement->AddQualifier(decl, FittedTo(decl->GetDefaultValue(none), value), decl->GetFlavor(none), none);
+  });
+  return *this;
+}
+
+TMemoryClassBuilder& TMemoryClassBuilder::Parameter(std::string const& name, TMemoryType const& type) {
+  NameRefusal(ClassName(), name, [&] {
+    if (!fMethod) throw TZEPException(kZEPStatusInvalidOpSequence);
+    fElement = fMethod->AddParameterDecl(name, type.GetType(), type.GetMaxArraySize(), "", TCIMContext());
+  });
+  return *this;
+}
+
+std::string TMemoryClassBuilder::ClassName() const { return fClass->GetName(TCIMContext()); }
+
+}  // namespace NQRVZEP20

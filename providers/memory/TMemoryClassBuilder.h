@@ -1,0 +1,73 @@
+#pragma once
+
+#include "TCIMValue.h"
+#include "providers/memory/TMemoryType.h"
+
+#include <boost/shared_ptr.hpp>
+
+#include <string>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+class ICIMMethodDecl;
+class ICIMNamedElement;
+class ICIMNamespace;
+class TMemoryClass;
+
+// Describes a class in the order in which a schema would; TMemoryNamespace::DefineClass makes one. Every operation returns
+// the builder itself. A qualifier is written on what was described last: the class, a property, a method or a parameter.
+//
+//   ns->DefineClass("X_Disk", "X_Device")
+//       .Description("A disk of this machine.")
+//       .Property("State", "uint16").ValueMap({"0", "1"}, {"Unknown", "Ready"})
+//       .Method("Reset", "uint32").In("Force", "boolean").Out("Log", "string[]");
+//
+// What is refused is named in the log, as an error, before the exception passes on; what was described before stays.
+class TMemoryClassBuilder {
+public:
+  explicit TMemoryClassBuilder(boost::shared_ptr<TMemoryClass> cls);
+
+  // ---- Properties. A default value follows the rules of TMemoryInstance::Set. ----
+
+  TMemoryClassBuilder& Property(std::string const& name, TMemoryType const& type, TCIMValue const& defaultValue = TCIMValue());
+  TMemoryClassBuilder& Key(std::string const& name, TMemoryType const& type);
+
+  // A property that refers to instances of that class, which is there already.
+  TMemoryClassBuilder& Reference(std::string const& name, std::string const& className);
+  TMemoryClassBuilder& KeyReference(std::string const& name, std::string const& className);
+
+  // A property whose value belongs to the class.
+  TMemoryClassBuilder& Static(std::string const& name, TMemoryType const& type, TCIMValue const& value);
+
+  // ---- Methods, and the parameters of the method described last ----
+
+  TMemoryClassBuilder& Method(std::string const& name, TMemoryType const& returnType);
+  TMemoryClassBuilder& In(std::string const& name, TMemoryType const& type);
+  TMemoryClassBuilder& Out(std::string const& name, TMemoryType const& type);
+
+  // ---- Qualifiers ----
+
+  TMemoryClassBuilder& Abstract();
+  TMemoryClassBuilder& Association();
+  TMemoryClassBuilder& Description(std::string const& text);
+  TMemoryClassBuilder& Override();  // on a property that a superclass declares too
+
+  // What the values of an enumeration mean, one word for each.
+  TMemoryClassBuilder& ValueMap(std::vector<std::string> const& values, std::vector<std::string> const& words);
+
+  // Any qualifier that the namespace declares, with its declared flavor. An integer may be given in any integer type.
+  TMemoryClassBuilder& Qualifier(std::string const& name, TCIMValue const& value);
+
+  boost::shared_ptr<TMemoryClass> Class() const { return fClass; }
+
+private:
+  TMemoryClassBuilder& Parameter(std::string const& name, TMemoryType const& type);
+  std::string ClassName() const;
+
+  boost::shared_ptr<TMemoryClass> fClass;
+  boost::shared_ptr<ICIMMethodDecl> fMethod;     // the one described last; empty until then
+  boost::shared_ptr<ICIMNamedElement> fElement;  // what was described last
+};
+
+}  // namespace NQRVZEP20

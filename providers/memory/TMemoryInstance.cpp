@@ -1,0 +1,65 @@
+#include "providers/memory/TMemoryInstance.h"
+
+#include "TZEPException.h"
+#include "providers/memory/Fitting.h"
+#include "providers/memory/TMemoryClass.h"
+#include "providers/memory/TMemoryPropertyDecl.h"
+
+#include <boost/make_shared.hpp>
+
+namespace NQRVZEP20 {
+
+TMemoryInstance::TMemoryInstance(boost::weak_ptr<TMemoryClass> cls, boost::shared_ptr<TMemoryLayout const> layout)
+    : fClass(cls), fLayout(layout) {
+  fProperties.reserve(fLayout->fDecls.Elements().size());
+  for (auto const& decl : fLayout->fDecls.Elements()) fProperties.push_back(boost::make_shared<TMemoryProperty>(decl));
+}
+
+boost::shared_ptr<ICIMClass> TMemoryInstance::GetClass(TCIMContext const&) const { return boost::shared_ptr<ICIMClass>(fClass); }
+
+boost::shared_ptr<ICIMProperty> TMemoryInstance::GetProperty(std::string const& name, TCIMContext const&) const {
+  const std::size_t position = fLayout->fDecls.PositionOf(name);
+  return position == fLayout->fDecls.kNone ? boost::shared_ptr<ICIMProperty>() : fProperties[position];
+}
+
+void TMemoryInstance::EnumerateProperties(boost::function<bool(boost::shared_ptr<ICIMProperty>)> callback,
+                                          TCIMContext const&) const {
+  VisitEach(fProperties, callback);
+}
+
+TCIMReference TMemoryInstance::GetPath(TCIMContext const& context) const {
+  const boost::shared_ptr<ICIMClass> cls = GetClass(context);
+  TCIMReference path(cls->GetNamespace(context), context);
+  path.SetClass(cls);
+  for (const std::size_t key : fLayout->fKeys) {
+    const TCIMValue value = fProperties[key]->GetValue(context);
+    if (!value.IsNull()) path.AddKeyValue(fProperties[key]->GetName(context), value);
+  }
+  return path;
+}
+
+void TMemoryInstance::Set(std::string const& name, TCIMValue const& value) {
+  const TCIMContext none;
+  TMemoryProperty& property = PropertyOf(name);
+  property.SetValue(FittedTo(property.GetDeclaration(none)->GetDefaultValue(none), value), none);
+}
+
+TCIMValue TMemoryInstance::Get(std::string const& name) const { return PropertyOf(name).GetValue(TCIMContext()); }
+
+TCIMValue TMemoryInstance::GetReference() const {
+  TCIMReference path = GetPath(TCIMContext());
+  return TCIMValue(path);
+}
+
+void TMemoryInstance::SetCommitted() {
+  fIsCommitted = true;
+  for (const std::size_t key : fLayout->fKeys) fProperties[key]->Fix();
+}
+
+TMemoryProperty& TMemoryInstance::PropertyOf(std::string const& name) const {
+  const std::size_t position = fLayout->fDecls.PositionOf(name);
+  if (position == fLayout->fDecls.kNone) throw TZEPException(kZEPStatusNotFound);
+  return *fProperties[position];
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,62 @@
+#pragma once
+
+#include "ICIMNamespace.h"
+#include "TZEPException.h"
+#include "providers/memory/TMemoryQualifier.h"
+#include "providers/memory/TNamedList.h"
+
+#include <boost/enable_shared_from_this.hpp>
+#include <boost/make_shared.hpp>
+
+#include <string>
+
+namespace NQRVZEP20 {
+
+// The name and the qualifiers of an element: what classes, property, method and parameter declarations have in common.
+// `TInterface` is the element's own interface, which derives from ICIMNamedElement.
+template <class TInterface>
+class TMemoryNamedElement : public TInterface, public boost::enable_shared_from_this<TMemoryNamedElement<TInterface>> {
+public:
+  std::string GetName(TCIMContext const&) const override { return fName; }
+
+  boost::shared_ptr<ICIMQualifier> GetQualifier(std::string const& name, TCIMContext const&) const override {
+    return fQualifiers.Find(name);
+  }
+
+  void EnumerateQualifiers(boost::function<bool(boost::shared_ptr<ICIMQualifier>)> callback, TCIMContext const&) const override {
+    VisitEach(fQualifiers.Elements(), callback);
+  }
+
+  // Throws kZEPStatusNotFound when the declaration is not one of this element's namespace.
+  boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
+                                                unsigned int flavor, TCIMContext const& context) override {
+    const std::string name = declaration->GetName(context);
+    const boost::shared_ptr<ICIMNamespace> ns(fNamespace);
+    if (ns->GetQualifierDecl(name, context) != declaration) throw TZEPException(kZEPStatusNotFound);
+    if (value.GetType() != declaration->GetType(context)) throw TZEPException(kZEPStatusTypeMismatch);
+    if (fQualifiers.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
+
+    const auto qualifier = boost::make_shared<TMemoryQualifier>(declaration, this->weak_from_this(), value, flavor);
+    fQualifiers.Add(name, qualifier);
+    return qualifier;
+  }
+
+  // Whether the element itself carries the qualifier, with any value but false.
+  bool IsMarked(std::string const& qualifierName) const {
+    const boost::shared_ptr<TMemoryQualifier> qualifier = fQualifiers.Find(qualifierName);
+    return qualifier && qualifier->IsSet();
+  }
+
+protected:
+  TMemoryNamedElement(std::string const& name, boost::weak_ptr<ICIMNamespace> ns) : fName(name), fNamespace(ns) {}
+
+  std::string const& Name() const { return fName; }
+  boost::weak_ptr<ICIMNamespace> Namespace() const { return fNamespace; }
+
+private:
+  std::string fName;
+  boost::weak_ptr<ICIMNamespace> fNamespace;
+  TNamedList<TMemoryQualifier> fQualifiers;
+};
+
+}  // namespace NQRVZEP20

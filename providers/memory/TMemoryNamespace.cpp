@@ -1,0 +1,107 @@
+#include "providers/memory/TMemoryNamespace.h"
+
+#include "TZEPException.h"
+#include "providers/memory/CIMTypes.h"
+#include "providers/memory/FillLog.h"
+#include "providers/memory/StandardQualifiers.h"
+#include "providers/memory/TMemoryClass.h"
+#include "providers/memory/TMemoryQualifierDecl.h"
+
+#include <boost/make_shared.hpp>
+
+namespace NQRVZEP20 {
+
+TMemoryNamespace::TMemoryNamespace(std::string const& name) : fName(name) {}
+
+TMemoryNamespace::~TMemoryNamespace() {
+  for (auto const& cls : fClasses.Elements()) cls->Empty();
+}
+
+std::string TMemoryNamespace::GetName(TCIMContext const&) const { return fName; }
+
+boost::shared_ptr<ICIMClass> TMemoryNamespace::CreateClass(boost::shared_ptr<ICIMClass> superClass, std::string const& name,
+                                                           TCIMContext const& context) {
+  RequireCIMName(name);
+  boost::shared_ptr<TMemoryClass> ownSuperClass;
+  if (superClass) {
+    ownSuperClass = fClasses.Find(superClass->GetName(context));
+    if (ownSuperClass != superClass) throw TZEPException(kZEPStatusInvalidClass);
+  }
+  if (fClasses.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
+
+  const auto cls = boost::make_shared<TMemoryClass>(shared_from_this(), ownSuperClass, name);
+  fClasses.Add(name, cls);
+  if (ownSuperClass)
+    ownSuperClass->AddSubClass(cls);
+  else
+    fRootClasses.push_back(cls);
+  return cls;
+}
+
+boost::shared_ptr<ICIMClass> TMemoryNamespace::GetClass(std::string const& className, TCIMContext const&) const {
+  return FindClass(className);
+}
+
+void TMemoryNamespace::EnumerateClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)> callback, TCIMContext const&) const {
+  VisitEach(fRootClasses, callback);
+}
+
+boost::shared_ptr<ICIMQualifierDecl> TMemoryNamespace::CreateQualifierDecl(std::string const& name, TCIMValue const& defaultValue,
+                                                                           unsigned int scope, unsigned int flavor,
+                                                                           TCIMContext const&) {
+  RequireCIMName(name);
+  const TCIMValue::TCIMType type = defaultValue.GetType();
+  if (!HasTypeName(type) || BaseTypeOf(type) == TCIMValue::TCIMType::kCIMTypeReference)
+    throw TZEPException(kZEPStatusTypeMismatch);
+  if (fQualifierDecls.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
+
+  const auto decl = boost::make_shared<TMemoryQualifierDecl>(name, defaultValue, scope, flavor);
+  fQualifierDecls.Add(name, decl);
+  return decl;
+}
+
+boost::shared_ptr<ICIMQualifierDecl> TMemoryNamespace::GetQualifierDecl(std::string const& name, TCIMContext const&) const {
+  const boost::shared_ptr<ICIMQualifierDecl> decl = fQualifierDecls.Find(name);
+  if (!decl) throw TZEPException(kZEPStatusNotFound);
+  return decl;
+}
+
+void TMemoryNamespace::EnumerateQualifierDecls(boost::function<bool(boost::shared_ptr<ICIMQualifierDecl>)> callback,
+                                               TCIMContext const&) const {
+  VisitEach(fQualifierDecls.Elements(), callback);
+}
+
+boost::shared_ptr<ICIMInstance> TMemoryNamespace::GetInstance(TCIMReference const& path, TCIMContext const& context) const {
+  const boost::shared_ptr<ICIMClass> named = path.GetClass();
+  const boost::shared_ptr<TMemoryClass> cls = named ? fClasses.Find(named->GetName(context)) : nullptr;
+  return cls ? cls->FindInstance(path) : boost::shared_ptr<TMemoryInstance>();
+}
+
+TMemoryClassBuilder TMemoryNamespace::DefineClass(std::string const& name, std::string const& superClassName) {
+  DeclareStandardQualifiers();
+  return NameRefusal(name, "", [&] {
+    const boost::shared_ptr<ICIMClass> superClass = superClassName.empty() ? nullptr : FindClass(superClassName);
+    const boost::shared_ptr<ICIMClass> cls = CreateClass(superClass, name, TCIMContext());
+    return TMemoryClassBuilder(boost::static_pointer_cast<TMemoryClass>(cls));
+  });
+}
+
+boost::shared_ptr<TMemoryInstance> TMemoryNamespace::AddInstance(std::string const& className, TMemoryValues const& values) {
+  return NameRefusal(className, "", [&] { return FindClass(className); })->AddInstance(values);
+}
+
+void TMemoryNamespace::DeclareStandardQualifiers() {
+  if (fHasStandardQualifiers) return;
+  for (auto const& standard : StandardQualifiers())
+    if (!fQualifierDecls.Has(standard.fName))
+      CreateQualifierDecl(standard.fName, standard.fDefaultValue, standard.fScope, standard.fFlavor, TCIMContext());
+  fHasStandardQualifiers = true;
+}
+
+boost::shared_ptr<TMemoryClass> TMemoryNamespace::FindClass(std::string const& name) const {
+  const boost::shared_ptr<TMemoryClass> cls = fClasses.Find(name);
+  if (!cls) throw TZEPException(kZEPStatusNotFound);
+  return cls;
+}
+
+}  // namespace NQRVZEP20

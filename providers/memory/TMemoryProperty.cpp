@@ -1,0 +1,29 @@
+#include "providers/memory/TMemoryProperty.h"
+
+#include "ICIMPropertyDecl.h"
+#include "TZEPException.h"
+
+#include <utility>
+
+namespace NQRVZEP20 {
+
+TMemoryProperty::TMemoryProperty(boost::shared_ptr<ICIMPropertyDecl const> declaration)
+    : fDeclaration(declaration), fValue(declaration->GetDefaultValue(TCIMContext())) {}
+
+TCIMValue TMemoryProperty::GetValue(TCIMContext const&) const { return fValue; }
+
+void TMemoryProperty::SetValue(TCIMValue const& value, TCIMContext const&) {
+  if (fIsFixed) throw TZEPException(kZEPStatusInvalidOpSequence);
+  if (value.GetType() != fValue.GetType()) throw TZEPException(kZEPStatusTypeMismatch);
+
+  // Assigning a value that compares equal changes nothing, and any two char16 compare equal. So forget the old one first.
+  TCIMValue copy(value);
+  fValue.SetNullValue(TCIMValue::TCIMType::kCIMTypeInvalid, 0);
+  fValue = std::move(copy);
+}
+
+std::string TMemoryProperty::GetName(TCIMContext const& context) const { return fDeclaration->GetName(context); }
+
+boost::shared_ptr<ICIMPropertyDecl const> TMemoryProperty::GetDeclaration(TCIMContext const&) const { return fDeclaration; }
+
+}  // namespace NQRVZEP20

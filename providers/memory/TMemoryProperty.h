@@ -1,0 +1,28 @@
+#pragma once
+
+#include "ICIMProperty.h"
+#include "TCIMValue.h"
+
+namespace NQRVZEP20 {
+
+// One property value. Made by TMemoryClass, for an instance or for the class itself.
+class TMemoryProperty : public ICIMProperty {
+public:
+  // Starts with the declared default.
+  explicit TMemoryProperty(boost::shared_ptr<ICIMPropertyDecl const> declaration);
+
+  TCIMValue GetValue(TCIMContext const& context) const override;
+  void SetValue(TCIMValue const& value, TCIMContext const& context) override;
+  std::string GetName(TCIMContext const& context) const override;
+  boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(TCIMContext const& context) const override;
+
+  // From now on SetValue throws kZEPStatusInvalidOpSequence: the value is a key by which the instance is filed.
+  void Fix() { fIsFixed = true; }
+
+private:
+  boost::shared_ptr<ICIMPropertyDecl const> fDeclaration;
+  TCIMValue fValue;  // always of the declared type
+  bool fIsFixed = false;
+};
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,25 @@
+#include "providers/memory/TMemoryProvider.h"
+
+#include "providers/memory/TMemoryNamespace.h"
+
+#include <boost/make_shared.hpp>
+
+namespace NQRVZEP20 {
+
+TMemoryProvider::TMemoryProvider(std::string const& name, std::string const& namespaceName, TFill fill)
+    : fName(name), fNamespaceName(namespaceName), fFill(fill) {}
+
+TMemoryProvider::~TMemoryProvider() = default;
+
+std::string const& TMemoryProvider::GetName(TCIMContext const&) const { return fName; }
+
+boost::shared_ptr<ICIMNamespace> TMemoryProvider::GetNamespace(TCIMContext const&) {
+  if (!fNamespace) {
+    const auto ns = boost::make_shared<TMemoryNamespace>(fNamespaceName);
+    fFill(*ns);
+    fNamespace = ns;
+  }
+  return fNamespace;
+}
+
+}  // namespace NQRVZEP20

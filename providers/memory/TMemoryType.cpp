@@ -1,0 +1,47 @@
+#include "providers/memory/TMemoryType.h"
+
+#include "providers/memory/CIMTypes.h"
+
+#include <charconv>
+#include <optional>
+#include <string_view>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+// The bound in "[16]", 0 for "[]"; nothing when the text is neither.
+std::optional<unsigned int> ParseBrackets(std::string_view text) {
+  if (text.size() < 2 || text.front() != '[' || text.back() != ']') return std::nullopt;
+  const std::string_view digits = text.substr(1, text.size() - 2);
+  if (digits.empty()) return 0u;
+
+  unsigned int bound = 0;
+  const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), bound);
+  if (error != std::errc() || end != digits.data() + digits.size() || bound == 0) return std::nullopt;
+  return bound;
+}
+
+}  // namespace
+
+TMemoryType::TMemoryType(char const* text) : fType(TCIMValue::TCIMType::kCIMTypeInvalid) {
+  const std::string_view type(text);
+  const std::size_t bracket = type.find('[');
+  const TCIMValue::TCIMType base(std::string(type.substr(0, bracket)));
+  if (base == TCIMValue::TCIMType::kCIMTypeInvalid || bracket == type.npos) {
+    fType = base;
+    return;
+  }
+  if (const std::optional<unsigned int> bound = ParseBrackets(type.substr(bracket))) {
+    fType = ArrayOf(base);
+    fMaxArraySize = *bound;
+  }
+}
+
+TCIMValue TMemoryType::GetNull() const {
+  TCIMValue null;
+  null.SetNullValue(fType, fMaxArraySize);
+  return null;
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,663 @@
+#include "TCIMSchemaHelper.h"
+
+#include "Fakes.h"
+#include "tests/Support.h"
+
+#include <functional>
+#include <set>
+
+namespace NQRVZEP20 {
+namespace {
+
+using TNames = std::vector<std::string>;
+using TNamespace = boost::shared_ptr<ICIMNamespace>;
+using TQuery = std::function<std::string(TNamespace)>;
+
+TCIMValue NullOf(ECIMType type) {
+  TCIMValue value;
+  value.SetNullValue(type, 0);
+  return value;
+}
+
+TCIMValue Strings(TNames const& texts) {
+  return TCIMValue(ECIMType::kCIMTypeString, 0, std::vector<TCIMValue>(texts.begin(), texts.end()));
+}
+
+// The single-property queries: what each reads.
+struct TSingleQuery {
+  char const* name;
+  TQuery query;
+  char const* className;
+  char const* property;
+};
+
+std::vector<TSingleQuery> const& PlainQueries() {
+  using THelper = TCIMSchemaHelper;
+  static std::vector<TSingleQuery> const queries = {
+      {"GetSystemProductName", THelper::GetSystemProductName, "QRVSG_ComputerSystem", "ProductName"},
+      {"GetSystemName", THelper::GetSystemName, "QRVSG_ComputerSystem", "Name"},
+      {"GetOperatingSystemName", THelper::GetOperatingSystemName, "QRVSG_OperatingSystem", "Name"},
+      {"GetOperatingSystemVersion", THelper::GetOperatingSystemVersion, "QRVSG_OperatingSystem", "Version"},
+      {"GetOperatingSystemType", THelper::GetOperatingSystemType, "QRVSG_OperatingSystem", "OSType"},
+      {"GetDataSourceVersion", [](TNamespace ns) { return THelper::GetDataSourceVersion(ns, TCIMContext()); }, "QRVSG_ZEPProduct",
+       "Version"},
+      {"GetDataSourceBuild", [](TNamespace ns) { return THelper::GetDataSourceBuild(ns, TCIMContext()); }, "QRVSG_ZEPProduct",
+       "Build"},
+  };
+  return queries;
+}
+
+std::vector<TSingleQuery> const& LoggedQueries() {
+  using THelper = TCIMSchemaHelper;
+  static std::vector<TSingleQuery> const queries = {
+      {"GetRawMTMString", THelper::GetRawMTMString, "QRVSG_ComputerSystem", "ProductName"},
+      {"GetRawSerialNumberString", [](TNamespace ns) { return THelper::GetRawSerialNumberString(ns, TCIMContext()); },
+       "QRVSG_ComputerSystem", "SerialNumber"},
+  };
+  return queries;
+}
+
+std::vector<TSingleQuery> AllSingleQueries() {
+  std::vector<TSingleQuery> queries = PlainQueries();
+  queries.insert(queries.end(), LoggedQueries().begin(), LoggedQueries().end());
+  return queries;
+}
+
+// Everything that is built on a single-property query, with the class it depends on.
+std::vector<TSingleQuery> DerivedQueries() {
+  using THelper = TCIMSchemaHelper;
+  return {
+      {"GetMTM", THelper::GetMTM, "QRVSG_ComputerSystem", "ProductName"},
+      {"GetMachineType", THelper::GetMachineType, "QRVSG_ComputerSystem", "ProductName"},
+      {"GetModelNumber", THelper::GetModelNumber, "QRVSG_ComputerSystem", "ProductName"},
+      {"GetSerialNumber", [](TNamespace ns) { return THelper::GetSerialNumber(ns, TCIMContext()); }, "QRVSG_ComputerSystem",
+       "SerialNumber"},
+      {"GetDataSourceMajorVersion", [](TNamespace ns) { return THelper::GetDataSourceMajorVersion(ns, TCIMContext()); },
+       "QRVSG_ZEPProduct", "Version"},
+      {"GetDataSourceMinorVersion", [](TNamespace ns) { return THelper::GetDataSourceMinorVersion(ns, TCIMContext()); },
+       "QRVSG_ZEPProduct", "Version"},
+      {"GetDataSourceBuildVersion", THelper::GetDataSourceBuildVersion, "QRVSG_ZEPProduct", "Version"},
+  };
+}
+
+class TCIMSchemaHelperTest : public testing::Test {
+protected:
+  // A namespace with one class that has one instance with one property.
+  static boost::shared_ptr<TFakeNamespace> With(std::string const& className, std::string const& property,
+                                                TCIMValue const& value) {
+    auto const ns = boost::make_shared<TFakeNamespace>();
+    ns->Add(className).AddInstance()->Add(property, value);
+    return ns;
+  }
+
+  static boost::shared_ptr<TFakeNamespace> WithProductName(TCIMValue const& value) {
+    return With("QRVSG_ComputerSystem", "ProductName", value);
+  }
+
+  static boost::shared_ptr<TFakeNamespace> WithSerialNumber(TCIMValue const& value) {
+    return With("QRVSG_ComputerSystem", "SerialNumber", value);
+  }
+
+  static boost::shared_ptr<TFakeNamespace> WithVersion(TCIMValue const& value) {
+    return With("QRVSG_ZEPProduct", "Version", value);
+  }
+};
+
+// ---- Constants ----
+
+TEST_F(TCIMSchemaHelperTest, Constants) {
+  EXPECT_EQ(TCIMSchemaHelper::kSystemCreationClassName, "QRVSG_ComputerSystem");
+  EXPECT_EQ(TCIMSchemaHelper::kOperatingSystemCreationClassName, "QRVSG_OperatingSystem");
+  EXPECT_EQ(TCIMSchemaHelper::kContextName, "nspID");
+  EXPECT_EQ(TCIMSchemaHelper::kPluginNSPName, "plugin");
+  EXPECT_EQ(TCIMSchemaHelper::kCMPINSPName, "cmpi");
+  EXPECT_EQ(TCIMSchemaHelper::GetSystemCreationClassName(), "QRVSG_ComputerSystem");
+  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemCreationClassName(), "QRVSG_OperatingSystem");
+}
+
+// ---- Single properties ----
+
+TEST_F(TCIMSchemaHelperTest, ASingleQueryReadsItsPropertyOfItsClassAsItStandsAndLogsNothing) {
+  for (auto const& row : AllSingleQueries()) {
+    SCOPED_TRACE(row.name);
+    TLogCapture log;
+    EXPECT_EQ(row.query(With(row.className, row.property, TCIMValue(" The text - as it is  "))), " The text - as it is  ");
+    EXPECT_EQ(row.query(With(row.className, row.property, TCIMValue(""))), "");
+    EXPECT_EQ(log.Entries(), TNames());
+  }
+}
+
+TEST_F(TCIMSchemaHelperTest, WhatIsMissingThrowsNotFound) {
+  auto queries = AllSingleQueries();
+  for (auto const& derived : DerivedQueries()) queries.push_back(derived);
+  for (auto const& row : queries) {
+    SCOPED_TRACE(row.name);
+    auto const ns = boost::make_shared<TFakeNamespace>();
+    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // no class
+    ns->fAnswersUnknownByEmpty = true;
+    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);
+    auto& cls = ns->Add(row.className);
+    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // no instance
+    auto const instance = cls.AddInstance();
+    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // no such property
+    instance->fCalls.fFailure = kZEPStatusNotFound;
+    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);
+    instance->fCalls.fFailure.reset();
+    instance->Add(row.property, TCIMValue("1234ABC"));
+    cls.AddInstance()->Add(row.property, TCIMValue("1234ABC"));
+    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // two instances
+  }
+}
+
+TEST_F(TCIMSchemaHelperTest, PlainQueriesLogNoFailure) {
+  for (auto const& row : PlainQueries()) {
+    SCOPED_TRACE(row.name);
+    TLogCapture log;
+    auto const ns = boost::make_shared<TFakeNamespace>();
+    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);
+    ns->Add(row.className);
+    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);
+    ns->Class(row.className)->AddInstance();
+    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);
+    EXPECT_EQ(log.Entries(), TNames());
+  }
+}
+
+TEST_F(TCIMSchemaHelperTest, PlainQueriesThrowWhatTheConversionThrows) {
+  for (auto const& row : PlainQueries()) {
+    SCOPED_TRACE(row.name);
+    TLogCapture log;
+    EXPECT_STATUS(row.query(With(row.className, row.property, NullOf(ECIMType::kCIMTypeString))), kZEPStatusValueIsNULL);
+    EXPECT_STATUS(row.query(With(row.className, row.property, TCIMValue(5u))), kZEPStatusTypeMismatch);
+    EXPECT_STATUS(row.query(With(row.className, row.property, Strings({"a"}))), kZEPStatusTypeMismatch);
+    EXPECT_EQ(log.Entries(), TNames());
+  }
+}
+
+TEST_F(TCIMSchemaHelperTest, OtherFailuresOfTheNamespacePass) {
+  auto queries = AllSingleQueries();
+  for (auto const& derived : DerivedQueries()) queries.push_back(derived);
+  for (auto const& row : queries) {
+    SCOPED_TRACE(row.name);
+    auto const ns = With(row.className, row.property, TCIMValue("1234ABC"));
+    ns->fCalls.fFailure = kZEPStatusConnectionFailed;
+    EXPECT_STATUS(row.query(ns), kZEPStatusConnectionFailed);
+  }
+}
+
+TEST_F(TCIMSchemaHelperTest, AnEmptyNamespaceIsAFailedAssertion) {
+  TEnvironmentGuard const mode("ZEP_BOOST_ASSERT", nullptr);
+  EXPECT_STATUS(TCIMSchemaHelper::GetSystemName(nullptr), kZEPStatusFail);
+}
+
+TEST_F(TCIMSchemaHelperTest, EveryCallCarriesTheProviderToAsk) {
+  auto queries = AllSingleQueries();
+  for (auto const& derived : DerivedQueries()) queries.push_back(derived);
+  for (auto const& row : queries) {
+    SCOPED_TRACE(row.name);
+    auto const ns = boost::make_shared<TFakeNamespace>();
+    auto const instance = ns->Add(row.className).AddInstance();
+    auto const property = instance->Add(row.property, TCIMValue("1234ABC"));
+    try {
+      row.query(ns);
+    } catch (TZEPException const&) {  // the text is no version: it has been read all the same
+    }
+    TCIMContext const expected = {{"nspID", TCIMValue("plugin")}};
+    for (TCalls const* calls : {&ns->fCalls, &ns->Class(row.className)->fCalls, &instance->fCalls, &property->fCalls})
+      EXPECT_EQ(calls->fContexts, std::vector<TCIMContext>{expected});
+    EXPECT_EQ(ns->fCalls.fNames, TNames({row.className}));
+    EXPECT_EQ(instance->fCalls.fNames, TNames({row.property}));
+  }
+}
+
+TEST_F(TCIMSchemaHelperTest, TheCallersContextIsCarriedAlongAndMayNameTheProvider) {
+  using THelper = TCIMSchemaHelper;
+  struct {
+    char const* name;
+    std::function<std::string(TNamespace, TCIMContext)> query;
+  } const kRows[] = {
+      {"GetDataSourceVersion", THelper::GetDataSourceVersion},
+      {"GetDataSourceBuild", THelper::GetDataSourceBuild},
+      {"GetDataSourceMajorVersion", THelper::GetDataSourceMajorVersion},
+      {"GetDataSourceMinorVersion", THelper::GetDataSourceMinorVersion},
+      {"GetRawSerialNumberString", THelper::GetRawSerialNumberString},
+      {"GetSerialNumber", THelper::GetSerialNumber},
+      {"GetSerialNumber_vmwesxi", THelper::GetSerialNumber_vmwesxi},
+  };
+  for (auto const& row : kRows) {
+    SCOPED_TRACE(row.name);
+    auto const ns = boost::make_shared<TFakeNamespace>();
+    EXPECT_STATUS(row.query(ns, {{"who", TCIMValue("me")}}), kZEPStatusNotFound);
+    EXPECT_STATUS(row.query(ns, {{"nspID", TCIMValue("cmpi")}}), kZEPStatusNotFound);
+    EXPECT_EQ(ns->fCalls.fContexts, (std::vector<TCIMContext>{{{"nspID", TCIMValue("plugin")}, {"who", TCIMValue("me")}},
+                                                              {{"nspID", TCIMValue("cmpi")}}}));
+  }
+}
+
+TEST_F(TCIMSchemaHelperTest, LoggedQueriesLogEachReasonAtDebug) {
+  for (auto const& row : LoggedQueries()) {
+    SCOPED_TRACE(row.name);
+    std::string const property = row.property;
+    auto const none = boost::make_shared<TFakeNamespace>();
+    auto const noInstance = boost::make_shared<TFakeNamespace>();
+    noInstance->Add("QRVSG_ComputerSystem");
+    auto const two = With("QRVSG_ComputerSystem", property, TCIMValue("1234ABC"));
+    two->Class("QRVSG_ComputerSystem")->AddInstance();
+    auto const noProperty = With("QRVSG_ComputerSystem", "Other", TCIMValue("1234ABC"));
+    struct {
+      TNamespace ns;
+      std::string message;
+    } const kReasons[] = {
+        {none, "TCIMSchemaHelper: no computer system"},
+        {noInstance, "TCIMSchemaHelper: computer system instances != 1"},
+        {two, "TCIMSchemaHelper: computer system instances != 1"},
+        {noProperty, "TCIMSchemaHelper: didn't find " + property + " property"},
+        {With("QRVSG_ComputerSystem", property, NullOf(ECIMType::kCIMTypeString)), "TCIMSchemaHelper: " + property + " is NULL"},
+        {With("QRVSG_ComputerSystem", property, NullOf(ECIMType::kCIMTypeUint32)), "TCIMSchemaHelper: " + property + " is NULL"},
+        {With("QRVSG_ComputerSystem", property, TCIMValue(5u)), "TCIMSchemaHelper: " + property + " wasn't a string"},
+        {With("QRVSG_ComputerSystem", property, Strings({"1234ABC"})), "TCIMSchemaHelper: " + property + " wasn't a string"},
+    };
+    for (auto const& reason : kReasons) {
+      SCOPED_TRACE(reason.message);
+      TLogCapture log;
+      EXPECT_STATUS(row.query(reason.ns), kZEPStatusNotFound);
+      EXPECT_EQ(log.Entries(), TNames({"[Debug] " + reason.message}));
+    }
+  }
+}
+
+// ---- Machine type and model ----
+
+TEST_F(TCIMSchemaHelperTest, IsValidMachineType) {
+  for (char const* text : {"1234", "abcD", "Z9z0", "1234-", "1234ABC", "1234\n"}) {
+    SCOPED_TRACE(text);
+    EXPECT_TRUE(TCIMSchemaHelper::IsValidMachineType(text));
+  }
+  for (char const* text : {"", "123", "123 ", " 123", "12-4", "12_4",
+                           "12\xe4"
+                           "4",
+                           "123\xc3"}) {
+    SCOPED_TRACE(text);
+    EXPECT_FALSE(TCIMSchemaHelper::IsValidMachineType(text));
+  }
+}
+
+TEST_F(TCIMSchemaHelperTest, IsValidMTM) {
+  for (char const* text : {"1234ABC", "1234   ", "12345 x", "abcdxyz", "1234ABC-", "1234ABCDE"}) {
+    SCOPED_TRACE(text);
+    EXPECT_TRUE(TCIMSchemaHelper::IsValidMTM(text));
+  }
+  for (char const* text : {"", "1234", "1234AB", "1234AB-", "1234\tBC", "1234A_C", " 234ABC", "12 4ABC", "1234AB\xe4"}) {
+    SCOPED_TRACE(text);
+    EXPECT_FALSE(TCIMSchemaHelper::IsValidMTM(text));
+  }
+}
+
+struct TProductNameRow {
+  char const* productName;
+  char const* mtm;  // null: no MTM in it
+};
+
+TEST_F(TCIMSchemaHelperTest, FindsTheMTMInAProductName) {
+  TProductNameRow const kRows[] = {
+      // without brackets
+      {"1234", "1234xxx"},
+      {"1234ABC", "1234ABC"},
+      {"1234abc", "1234abc"},
+      {"1234ABC   ", "1234ABC"},
+      {"1234  ", "1234xxx"},
+      {"1234   ", "1234xxx"},  // its trailing blanks go first
+      {"1234A C", "1234A C"},
+      {"1234 BC", "1234 BC"},
+      {"12345", nullptr},
+      {"123456", nullptr},
+      {"12345678", nullptr},
+      {"123", nullptr},
+      {"", nullptr},
+      {"   ", nullptr},
+      {" 1234", nullptr},
+      {"12-4", nullptr},
+      {"1234A-C", nullptr},
+      {"1234\t", nullptr},
+      {"Server X1", nullptr},
+      {"Server [1234ABC]", nullptr},
+
+      // in brackets
+      {"Server X1-[1234ABC]-", "1234ABC"},
+      {"Server X1-[1234ABC]-   ", "1234ABC"},
+      {"Server X1-[1234]-", "1234xxx"},
+      {"-[1234ABC]", "1234ABC"},
+      {"-[1234]", "1234xxx"},
+      {"-[1234ABC]-[5678DEF]-", "1234ABC"},  // only the first counts
+      {"Server X1-[1234   ]-", "1234xxx"},
+      {"Server X1-[1234 B ]-", "1234 B "},
+      {"Server X1-[1234]BC]-", "1234xxx"},  // the 7 are none, the 4 are
+      {"Server X1-[1234ABC]x", "1234ABC"},
+      {"Server X1-[1234A]-", nullptr},  // the "]" is two places early
+      {"Server X1-[1234AB]-", nullptr},
+      {"Server X1-[123]-", nullptr},
+      {"Server X1-[1234ABCD]-", nullptr},
+      {"Server X1-[1234ABC", nullptr},
+      {"Server X1-[1234", nullptr},
+      {"Server X1-[", nullptr},
+      {"Server X1-[1234AB-]-", nullptr},
+      {"Server X1-[12-4ABC]-", nullptr},
+      {"Server X1-[12-4]-", nullptr},
+      {"Server X1-[]-[1234ABC]-", nullptr},
+      {"Server X1-[    ABC]-", nullptr},
+      {"1234-[", nullptr},
+  };
+  for (auto const& row : kRows) {
+    SCOPED_TRACE(row.productName);
+    auto const ns = WithProductName(TCIMValue(row.productName));
+    if (row.mtm == nullptr) {
+      EXPECT_STATUS(TCIMSchemaHelper::GetMTM(ns), kZEPStatusInvalidFormat);
+      continue;
+    }
+    EXPECT_EQ(TCIMSchemaHelper::GetMTM(ns), row.mtm);
+    EXPECT_EQ(TCIMSchemaHelper::GetMachineType(ns), std::string(row.mtm).substr(0, 4));
+    EXPECT_EQ(TCIMSchemaHelper::GetModelNumber(ns), std::string(row.mtm).substr(4));
+  }
+}
+
+TEST_F(TCIMSchemaHelperTest, FindsTheMTMInLegacyProductNames) {
+  TProductNameRow const kRows[] = {
+      {"System Model 1000-[1234ABC]", "1234ABC"},
+      {"System Model 1000-[1234ABC]  ", "1234ABC"},
+      {"System Model 1000-[1234   ]", "1234xxx"},
+      {"System Model 200-[1234ABC]", "1234ABC"},
+      {"System Model 200-[1234   ]", "1234xxx"},
+
+      // behind "- " nothing but the fixed place tells the MTM
+      {"System Model 3000- 1234ABC--", "1234ABC"},
+      {"System Model 3000- 1234ABC]-", "1234ABC"},
+      {"System Model 3000- 1234ABCD-  ", "1234ABC"},
+      {"System Model 3000- 1234   --", "1234xxx"},
+      {"System Model 3000- 1234AB---", nullptr},
+      {"System Model 3000- 12-4ABC--", nullptr},
+      {"System Model 3000- 1234ABC-", nullptr},    // too short
+      {"System Model 3000- 1234ABC---", nullptr},  // too long
+      {"System Model 3000- 1234ABC-]", nullptr},   // another closing
+      {"System Model 3001- 1234ABC--", nullptr},   // another model
+      {"system Model 3000- 1234ABC--", nullptr},
+  };
+  for (auto const& row : kRows) {
+    SCOPED_TRACE(row.productName);
+    auto const ns = WithProductName(TCIMValue(row.productName));
+    if (row.mtm == nullptr)
+      EXPECT_STATUS(TCIMSchemaHelper::GetMTM(ns), kZEPStatusInvalidFormat);
+    else
+      EXPECT_EQ(TCIMSchemaHelper::GetMTM(ns), row.mtm);
+  }
+}
+
+TEST_F(TCIMSchemaHelperTest, GetMTMLogsItsStartAndItsResult) {
+  TLogCapture log;
+  TCIMSchemaHelper::GetMTM(WithProductName(TCIMValue("Server X1-[1234]-")));
+  EXPECT_EQ(log.Entries(),
+            TNames({"[Debug] TCIMSchemaHelper- Detected MTM Entered", "[Debug] TCIMSchemaHelper- Detected MTM 1234xxx"}));
+}
+
+TEST_F(TCIMSchemaHelperTest, GetMTMLogsOnlyItsStartBeforeAFailure) {
+  {
+    TLogCapture log;
+    EXPECT_STATUS(TCIMSchemaHelper::GetMTM(WithProductName(TCIMValue("12345"))), kZEPStatusInvalidFormat);
+    EXPECT_EQ(log.Entries(), TNames({"[Debug] TCIMSchemaHelper- Detected MTM Entered"}));
+  }
+  TLogCapture log;
+  EXPECT_STATUS(TCIMSchemaHelper::GetMTM(boost::make_shared<TFakeNamespace>()), kZEPStatusNotFound);
+  EXPECT_EQ(log.Entries(),
+            TNames({"[Debug] TCIMSchemaHelper- Detected MTM Entered", "[Debug] TCIMSchemaHelper: no computer system"}));
+}
+
+// ---- Serial number ----
+
+TEST_F(TCIMSchemaHelperTest, ASerialNumberIsSevenLettersOrDigits) {
+  struct {
+    char const* serialNumber;
+    char const* result;  // null: not in the expected form
+  } const kRows[] = {
+      {"KQ1234A", "KQ1234A"},     {"1234567", "1234567"}, {"abcdefg", "abcdefg"}, {"KQ1234A ", "KQ1234A"},
+      {"KQ1234A    ", "KQ1234A"}, {"KQ1234AB", nullptr},  {"KQ1234", nullptr},    {"KQ1234 ", nullptr},
+      {" KQ1234A", nullptr},      {"KQ 234A", nullptr},   {"KQ-234A", nullptr},   {"KQ1234A\t", nullptr},
+      {"KQ1234\xe4", nullptr},    {"", nullptr},          {"       ", nullptr},
+  };
+  for (auto const& row : kRows) {
+    SCOPED_TRACE(row.serialNumber);
+    auto const ns = WithSerialNumber(TCIMValue(row.serialNumber));
+    TLogCapture log;
+    if (row.result == nullptr)
+      EXPECT_STATUS(TCIMSchemaHelper::GetSerialNumber(ns, TCIMContext()), kZEPStatusInvalidFormat);
+    else
+      EXPECT_EQ(TCIMSchemaHelper::GetSerialNumber(ns, TCIMContext()), row.result);
+    EXPECT_EQ(log.Entries(), TNames());
+  }
+}
+
+TEST_F(TCIMSchemaHelperTest, ARawSerialNumberKeepsItsBlanks) {
+  EXPECT_EQ(TCIMSchemaHelper::GetRawSerialNumberString(WithSerialNumber(TCIMValue(" KQ1234A ")), TCIMContext()), " KQ1234A ");
+}
+
+// ---- Parts of the data source's version ----
+
+TEST_F(TCIMSchemaHelperTest, PartsOfTheVersion) {
+  struct {
+    char const* version;
+    char const* major;  // null: not found
+    char const* minor;
+    char const* build;
+  } const kRows[] = {
+      {"3.20.5", "3", "20", "5"},
+      {"3.20.5.77", "3", "20", "77"},
+      {"3.20", "3", nullptr, "20"},
+      {"3", nullptr, nullptr, nullptr},
+      {"", nullptr, nullptr, nullptr},
+      {".", "", nullptr, ""},
+      {"..", "", "", ""},
+      {"3..5", "3", "", "5"},
+      {" 3 . 20 . 5 ", " 3 ", " 20 ", " 5 "},
+  };
+  using THelper = TCIMSchemaHelper;
+  for (auto const& row : kRows) {
+    SCOPED_TRACE(row.version);
+    auto const ns = WithVersion(TCIMValue(row.version));
+    struct {
+      char const* expected;
+      TQuery query;
+      TNames logged;
+    } const kParts[] = {
+        {row.major,
+         [](TNamespace of) { return THelper::GetDataSourceMajorVersion(of, TCIMContext()); },
+         {"[Debug] TCIMSchemaHelper::GetDataSourceMajorVersion - Throwing"}},
+        {row.minor, [](TNamespace of) { return THelper::GetDataSourceMinorVersion(of, TCIMContext()); }, {}},
+        {row.build, THelper::GetDataSourceBuildVersion, {}},
+    };
+    for (auto const& part : kParts) {
+      TLogCapture log;
+      if (part.expected == nullptr)
+        EXPECT_STATUS(part.query(ns), kZEPStatusNotFound);
+      else
+        EXPECT_EQ(part.query(ns), part.expected);
+      EXPECT_EQ(log.Entries(), part.expected == nullptr ? part.logged : TNames());
+    }
+  }
+}
+
+// ---- VMware ESXi hosts ----
+
+class TCIMSchemaHelperEsxiTest : public testing::Test {
+protected:
+  // An instance with one property.
+  void Add(std::string const& className, std::string const& property, TCIMValue const& value) {
+    auto& cls = classes_.count(className) ? *ns_->Class(className) : ns_->Add(className);
+    classes_.insert(className);
+    cls.AddInstance()->Add(property, value);
+  }
+
+  std::string SerialNumber() { return TCIMSchemaHelper::GetSerialNumber_vmwesxi(ns_, TCIMContext()); }
+
+  boost::shared_ptr<TFakeNamespace> const ns_ = boost::make_shared<TFakeNamespace>();
+
+private:
+  std::set<std::string> classes_;
+};
+
+TEST_F(TCIMSchemaHelperEsxiTest, WhatIsMissingIsUnknown) {
+  for (bool const answersByEmpty : {false, true}) {
+    ns_->fAnswersUnknownByEmpty = answersByEmpty;
+    EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Unknown");
+    EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(ns_), "Unknown");
+    EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "Unknown");
+  }
+  ns_->Add("CIM_PhysicalElement");
+  ns_->Add("VMware_HypervisorSoftwareIdentity");
+  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Unknown");
+  EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(ns_), "Unknown");
+  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "Unknown");
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, ValuesThatCannotBeReadAreSkipped) {
+  auto& elements = ns_->Add("CIM_PhysicalElement");
+  elements.AddInstance()->Add("Model", TCIMValue("Server X1-[1234ABC]-"));
+  elements.AddInstance();
+  elements.AddInstance()->Add("Model", NullOf(ECIMType::kCIMTypeString));
+  elements.AddInstance()->Add("Model", TCIMValue(5u));
+  elements.AddInstance()->Add("Model", Strings({"Server X2-[5678DEF]-"}));
+  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Server X1-[1234ABC]-");
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, TheLastModelWithBothBracketsIsTheProductName) {
+  for (char const* model : {"Server X1-[1234ABC]-", "Chassis", "Server X2-[5678DEF]-", "Server X3-[9999", "Server X4]-", "-["})
+    Add("CIM_PhysicalElement", "Model", TCIMValue(model));
+  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Server X2-[5678DEF]-");
+  EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(ns_), "5678DEF");
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, TheMTMIsWhatStandsBetweenTheFirstBrackets) {
+  struct {
+    char const* model;
+    char const* mtm;
+  } const kRows[] = {
+      {"Server X1-[1234ABC]-", "1234ABC"},
+      {"Server X1-[12]-", "12"},  // any length, any characters
+      {"Server X1-[1234 - A]-", "1234 - A"},
+      {"Server X1-[1234ABC]-[5678DEF]-", "1234ABC"},
+      {"Server X1-[-[1234ABC]-", "-[1234ABC"},
+      {"Server X1-[]-", "Unknown"},           // nothing between
+      {"Server ]-X1-[1234ABC]-", "Unknown"},  // the first "]-" comes first
+      {"]--[", "Unknown"},
+      {"Server X1", "Unknown"},
+  };
+  for (auto const& row : kRows) {
+    SCOPED_TRACE(row.model);
+    auto const ns = boost::make_shared<TFakeNamespace>();
+    ns->Add("CIM_PhysicalElement").AddInstance()->Add("Model", TCIMValue(row.model));
+    EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(ns), row.mtm);
+  }
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, TheLastLargeBuildNumberIsTheOperatingSystem) {
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue("12345"));
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue("23456"));
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", NullOf(ECIMType::kCIMTypeString));
+  Add("VMware_HypervisorSoftwareIdentity", "Other", TCIMValue("34567"));
+  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "23456");
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberMayBeANumber) {
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue(20000000000ul));
+  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "20000000000");
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, WithoutChassisTheSerialNumberIsNotFound) {
+  EXPECT_STATUS(SerialNumber(), kZEPStatusNotFound);
+  Add("OMC_UnitaryComputerSystem", "OtherIdentifyingInfo", Strings({"SN:KQ1234A"}));
+  EXPECT_STATUS(SerialNumber(), kZEPStatusNotFound);
+  ns_->Add("OMC_Chassis");
+  EXPECT_STATUS(SerialNumber(), kZEPStatusNotFound);
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, TheSerialNumberIsThatOfTheLastChassisThatHasOne) {
+  Add("OMC_Chassis", "Other", TCIMValue("x"));
+  EXPECT_EQ(SerialNumber(), "Unknown");
+  Add("OMC_Chassis", "SerialNumber", TCIMValue("KQ1234A"));
+  Add("OMC_Chassis", "SerialNumber", TCIMValue("any text "));
+  Add("OMC_Chassis", "SerialNumber", NullOf(ECIMType::kCIMTypeString));
+  Add("OMC_Chassis", "SerialNumber", TCIMValue(5u));
+  EXPECT_EQ(SerialNumber(), "any text ");
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, APlaceholderGivesWayToTheOtherIdentifyingInfo) {
+  struct {
+    char const* serialNumber;
+    char const* result;
+  } const kRows[] = {
+      {"XxXxXxX", "KQ1234A"}, {"none", "KQ1234A"}, {"None", "None"}, {"xxxxxxx", "xxxxxxx"}, {"none ", "none "}, {"", ""},
+  };
+  for (auto const& row : kRows) {
+    SCOPED_TRACE(row.serialNumber);
+    auto const ns = boost::make_shared<TFakeNamespace>();
+    ns->Add("OMC_Chassis").AddInstance()->Add("SerialNumber", TCIMValue(row.serialNumber));
+    ns->Add("OMC_UnitaryComputerSystem").AddInstance()->Add("OtherIdentifyingInfo", Strings({"x", "SN:KQ1234A", "UUID:0"}));
+    EXPECT_EQ(TCIMSchemaHelper::GetSerialNumber_vmwesxi(ns, TCIMContext()), row.result);
+  }
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, TheOtherIdentifyingInfoIsTheTextBehindTheColonOfTheFirstEntryWithOne) {
+  TCIMValue const withNull(ECIMType::kCIMTypeString, 0, {NullOf(ECIMType::kCIMTypeString), TCIMValue("SN:A")});
+  struct {
+    TCIMValue info;
+    char const* result;
+  } const kRows[] = {
+      {Strings({"a:b:c", "d:e"}), "b:c"},
+      {Strings({"SN: KQ1234A "}), " KQ1234A "},
+      {Strings({"SN:"}), ""},
+      {Strings({"a", "b"}), "Unknown"},
+      {Strings({}), "Unknown"},
+      {withNull, "A"},
+      {TCIMValue("SN:A"), "Unknown"},
+      {TCIMValue(5u), "Unknown"},
+      {NullOf(ECIMType::kCIMTypeString), "Unknown"},
+      {TCIMValue(ECIMType::kCIMTypeUint32, 0, {TCIMValue(5u)}), "Unknown"},
+  };
+  for (auto const& row : kRows) {
+    SCOPED_TRACE(row.info.IsNull() ? "NULL" : row.info.ToString(10).substr(0, 20));
+    auto const ns = boost::make_shared<TFakeNamespace>();
+    ns->Add("OMC_Chassis").AddInstance()->Add("SerialNumber", TCIMValue("none"));
+    ns->Add("OMC_UnitaryComputerSystem").AddInstance()->Add("OtherIdentifyingInfo", row.info);
+    EXPECT_EQ(TCIMSchemaHelper::GetSerialNumber_vmwesxi(ns, TCIMContext()), row.result);
+  }
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, TheLastSystemWithIdentifyingInfoCounts) {
+  Add("OMC_Chassis", "SerialNumber", TCIMValue("none"));
+  EXPECT_EQ(SerialNumber(), "Unknown");  // no such class
+  Add("OMC_UnitaryComputerSystem", "OtherIdentifyingInfo", Strings({"SN:A"}));
+  Add("OMC_UnitaryComputerSystem", "OtherIdentifyingInfo", Strings({"SN:B"}));
+  Add("OMC_UnitaryComputerSystem", "OtherIdentifyingInfo", Strings({"no colon"}));
+  Add("OMC_UnitaryComputerSystem", "Other", TCIMValue("x:y"));
+  EXPECT_EQ(SerialNumber(), "B");
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, OtherFailuresOfTheNamespacePass) {
+  ns_->fCalls.fFailure = kZEPStatusConnectionFailed;
+  EXPECT_STATUS(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), kZEPStatusConnectionFailed);
+  EXPECT_STATUS(TCIMSchemaHelper::GetMTM_vmwesxi(ns_), kZEPStatusConnectionFailed);
+  EXPECT_STATUS(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), kZEPStatusConnectionFailed);
+  EXPECT_STATUS(SerialNumber(), kZEPStatusConnectionFailed);
+}
+
+TEST_F(TCIMSchemaHelperEsxiTest, LogsNothingAndCarriesTheProviderToAsk) {
+  TLogCapture log;
+  TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_);
+  TCIMSchemaHelper::GetMTM_vmwesxi(ns_);
+  TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_);
+  EXPECT_STATUS(SerialNumber(), kZEPStatusNotFound);
+  EXPECT_EQ(log.Entries(), TNames());
+  EXPECT_EQ(ns_->fCalls.fNames,
+            TNames({"CIM_PhysicalElement", "CIM_PhysicalElement", "VMware_HypervisorSoftwareIdentity", "OMC_Chassis"}));
+  EXPECT_EQ(ns_->fCalls.fContexts, std::vector<TCIMContext>(4, TCIMContext{{"nspID", TCIMValue("plugin")}}));
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,166 @@
+#include "TNamespaceProviderManager.h"
+
+#include "TRootObject.h"
+#include "tests/Support.h"
+
+#include <boost/make_shared.hpp>
+
+#include <type_traits>
+
+namespace NQRVZEP20 {
+namespace {
+
+class TNamedProvider : public INamespaceProvider {
+public:
+  explicit TNamedProvider(std::string name) : fName(std::move(name)) {}
+  std::string const& GetName(TCIMContext const& context) const override {
+    fContexts.push_back(context);
+    return fName;
+  }
+  boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const&) override { return nullptr; }
+
+  mutable std::vector<TCIMContext> fContexts;
+
+private:
+  std::string fName;
+};
+
+boost::shared_ptr<TNamedProvider> ProviderNamed(std::string const& name) { return boost::make_shared<TNamedProvider>(name); }
+
+// The registry of the process keeps its providers for good, so most tests make a registry of their own.
+class TNamespaceProviderManagerTest : public testing::Test {
+protected:
+  std::vector<boost::shared_ptr<INamespaceProvider>> Enumerate(std::size_t stopAfter = 1000) {
+    std::vector<boost::shared_ptr<INamespaceProvider>> visited;
+    manager_.EnumerateNamespaceProviders([&](boost::shared_ptr<INamespaceProvider> provider) {
+      visited.push_back(provider);
+      return visited.size() < stopAfter;
+    });
+    return visited;
+  }
+
+  TNamespaceProviderManager manager_;
+};
+
+TEST_F(TNamespaceProviderManagerTest, FindsAProviderByItsName) {
+  auto const disks = ProviderNamed("Disks");
+  auto const host = ProviderNamed("Host");
+  manager_.RegisterNamespaceProvider(disks);
+  manager_.RegisterNamespaceProvider(host);
+  EXPECT_EQ(manager_.GetNamespaceProvider("Disks"), disks);
+  EXPECT_EQ(manager_.GetNamespaceProvider("Host"), host);
+}
+
+TEST_F(TNamespaceProviderManagerTest, AsksForTheNameOnceWithAnEmptyContext) {
+  auto const host = ProviderNamed("Host");
+  manager_.RegisterNamespaceProvider(host);
+  manager_.GetNamespaceProvider("Host");
+  Enumerate();
+  ASSERT_EQ(host->fContexts.size(), 1u);
+  EXPECT_TRUE(host->fContexts[0].empty());
+}
+
+TEST_F(TNamespaceProviderManagerTest, FirstProviderOfANameStaysAndNothingIsLogged) {
+  auto const first = ProviderNamed("Host");
+  auto const second = ProviderNamed("Host");
+  TLogCapture log;
+  manager_.RegisterNamespaceProvider(first);
+  manager_.RegisterNamespaceProvider(second);
+  EXPECT_EQ(manager_.GetNamespaceProvider("Host"), first);
+  EXPECT_EQ(Enumerate().size(), 1u);
+  EXPECT_EQ(second.use_count(), 1);
+  EXPECT_EQ(log.Entries(), std::vector<std::string>());
+}
+
+TEST_F(TNamespaceProviderManagerTest, NamesThatDifferInCaseAreTwoProviders) {
+  auto const upper = ProviderNamed("Host");
+  auto const lower = ProviderNamed("host");
+  manager_.RegisterNamespaceProvider(upper);
+  manager_.RegisterNamespaceProvider(lower);
+  EXPECT_EQ(manager_.GetNamespaceProvider("Host"), upper);
+  EXPECT_EQ(manager_.GetNamespaceProvider("host"), lower);
+}
+
+TEST_F(TNamespaceProviderManagerTest, UnknownNameIsLoggedAsOneErrorAndThrowsNotFound) {
+  manager_.RegisterNamespaceProvider(ProviderNamed("Host"));
+  for (std::string const name : {"Disks", "host", "Host ", ""}) {
+    SCOPED_TRACE(name);
+    TLogCapture log;
+    EXPECT_STATUS(manager_.GetNamespaceProvider(name), kZEPStatusNotFound);
+    EXPECT_EQ(log.Entries(), std::vector<std::string>({"[Error] Failed to find nsp named " + name}));
+  }
+}
+
+TEST_F(TNamespaceProviderManagerTest, EmptyProviderIsAFailedAssertionAndRegistersNothing) {
+  TEnvironmentGuard const mode("ZEP_BOOST_ASSERT", nullptr);
+  EXPECT_STATUS(manager_.RegisterNamespaceProvider(nullptr), kZEPStatusFail);
+  EXPECT_TRUE(Enumerate().empty());
+}
+
+TEST_F(TNamespaceProviderManagerTest, EmptyProviderFailsTheCheckOfThePointer) {
+  TEnvironmentGuard const mode("ZEP_BOOST_ASSERT", "throwboost");
+  try {
+    manager_.RegisterNamespaceProvider(nullptr);
+    FAIL() << "nothing was thrown";
+  } catch (std::exception const& failure) {
+    EXPECT_NE(std::string(failure.what()).find(" [px != 0] func = "), std::string::npos) << failure.what();
+  }
+}
+
+TEST_F(TNamespaceProviderManagerTest, EnumeratesInByteOrderOfTheNames) {
+  auto const b = ProviderNamed("b");
+  auto const upperB = ProviderNamed("B");
+  auto const high = ProviderNamed("\xc3\xa4");
+  auto const a = ProviderNamed("a");
+  for (auto const& provider : {b, high, upperB, a}) manager_.RegisterNamespaceProvider(provider);
+  EXPECT_EQ(Enumerate(), (std::vector<boost::shared_ptr<INamespaceProvider>>{upperB, a, b, high}));
+}
+
+TEST_F(TNamespaceProviderManagerTest, EnumerationStopsAtTheFirstFalse) {
+  for (char const* name : {"a", "b", "c"}) manager_.RegisterNamespaceProvider(ProviderNamed(name));
+  EXPECT_EQ(Enumerate(1).size(), 1u);
+  EXPECT_EQ(Enumerate(2).size(), 2u);
+  EXPECT_EQ(Enumerate().size(), 3u);
+}
+
+TEST_F(TNamespaceProviderManagerTest, AnEmptyRegistryCallsNothing) { EXPECT_TRUE(Enumerate().empty()); }
+
+TEST_F(TNamespaceProviderManagerTest, KeepsItsProvidersAlive) {
+  boost::weak_ptr<TNamedProvider> watched;
+  {
+    TNamespaceProviderManager manager;
+    auto const host = ProviderNamed("Host");
+    watched = host;
+    manager.RegisterNamespaceProvider(host);
+    EXPECT_EQ(host.use_count(), 2);
+  }
+  EXPECT_TRUE(watched.expired());
+}
+
+TEST(TRootObjectTest, HandsOutTheOneRegistryOfTheProcess) {
+  boost::shared_ptr<INamespaceProviderManager> const manager = TRootObject::GetNamespaceProviderManager();
+  ASSERT_TRUE(manager);
+  EXPECT_EQ(manager, TRootObject::GetNamespaceProviderManager());
+  EXPECT_EQ(manager, TNamespaceProviderManager::GetInstance());
+  OnNewThread([&] { EXPECT_EQ(manager, TNamespaceProviderManager::GetInstance()); });
+}
+
+// The use count shows that the registry keeps itself: one more owner than those of this test.
+TEST(TRootObjectTest, TheRegistryOwnsItself) { EXPECT_EQ(TNamespaceProviderManager::GetInstance().use_count(), 2); }
+
+TEST(TRootObjectTest, WhatIsRegisteredThereIsFoundThroughTheInterface) {
+  auto const provider = ProviderNamed("TRootObjectTest");
+  TRootObject::GetNamespaceProviderManager()->RegisterNamespaceProvider(provider);
+  EXPECT_EQ(TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("TRootObjectTest"), provider);
+}
+
+TEST(TRootObjectTest, CoreLoggerIsTheLoggerOfTheThread) {
+  EXPECT_EQ(TRootObject::GetCoreLogger(), TLogger::GetInstance());
+  OnNewThread([mine = TRootObject::GetCoreLogger()] {
+    EXPECT_EQ(TRootObject::GetCoreLogger(), TLogger::GetInstance());
+    EXPECT_NE(TRootObject::GetCoreLogger(), mine);
+  });
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,6 @@
+// A library that calls a function which nobody has.
+
+#include "ZEPExport.h"
+
+extern "C" void ThereIsNoSuchFunction();
+extern "C" ZEP_EXPORT void CallIt() { ThereIsNoSuchFunction(); }
