@@ -8,19 +8,19 @@ namespace NQRVZEP20 {
 // kZEPStatusTypeMismatch.
 class ZEP_EXPORT TCIMNumericValueImpl : public TCIMValueImpl {
 public:
-  explicit TCIMNumericValueImpl(bool value) noexcept;
-  explicit TCIMNumericValueImpl(unsigned char value) noexcept;
-  explicit TCIMNumericValueImpl(signed char value) noexcept;
-  explicit TCIMNumericValueImpl(unsigned short value) noexcept;
-  explicit TCIMNumericValueImpl(short value) noexcept;
-  explicit TCIMNumericValueImpl(unsigned int value) noexcept;
-  explicit TCIMNumericValueImpl(int value) noexcept;
-  explicit TCIMNumericValueImpl(unsigned long value) noexcept;
-  explicit TCIMNumericValueImpl(long value) noexcept;
-  explicit TCIMNumericValueImpl(float value) noexcept;
-  explicit TCIMNumericValueImpl(double value) noexcept;
-  TCIMNumericValueImpl(TCIMNumericValueImpl const& other);
-  ~TCIMNumericValueImpl() override;
+  explicit TCIMNumericValueImpl(bool value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeBoolean), fBoolean(value) {}
+  explicit TCIMNumericValueImpl(unsigned char value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint8), fUint8(value) {}
+  explicit TCIMNumericValueImpl(signed char value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint8), fSint8(value) {}
+  explicit TCIMNumericValueImpl(unsigned short value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint16), fUint16(value) {}
+  explicit TCIMNumericValueImpl(short value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint16), fSint16(value) {}
+  explicit TCIMNumericValueImpl(unsigned int value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint32), fUint32(value) {}
+  explicit TCIMNumericValueImpl(int value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint32), fSint32(value) {}
+  explicit TCIMNumericValueImpl(unsigned long value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint64), fUint64(value) {}
+  explicit TCIMNumericValueImpl(long value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint64), fSint64(value) {}
+  explicit TCIMNumericValueImpl(float value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeReal32), fReal32(value) {}
+  explicit TCIMNumericValueImpl(double value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeReal64), fReal64(value) {}
+  TCIMNumericValueImpl(TCIMNumericValueImpl const& other) noexcept = default;
+  ~TCIMNumericValueImpl() override = default;
 
   operator bool() const override;
   operator unsigned char() const override;

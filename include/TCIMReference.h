@@ -3,6 +3,7 @@
 #include "TCIMValue.h"
 #include "ZEPExport.h"
 
+#include <boost/assert.hpp>
 #include <boost/function.hpp>
 #include <boost/shared_ptr.hpp>
 
@@ -93,7 +94,10 @@ public:
   TCIMReferenceImpl* GetBody() const { return fBody.get(); }  // owned by this reference
 
 private:
-  TCIMReferenceImpl& Body() const;
+  TCIMReferenceImpl& Body() const {
+    BOOST_ASSERT(fBody != nullptr);
+    return *fBody;
+  }
   void BindBody() noexcept;  // tells the body whose it is now
 
   std::unique_ptr<TCIMReferenceImpl> fBody;  // null only in a reference that was moved from

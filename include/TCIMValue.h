@@ -151,8 +151,8 @@ public:
   bool IsNull() const noexcept { return !fImpl; }
   TCIMType GetType() const noexcept { return fType; }
   bool IsArray() const noexcept { return (fType & TCIMType::kCIMTypeArrayFlag) != 0; }
-  bool IsReference() const noexcept { return fType == TCIMType::kCIMTypeReference; }  // an array of references is not one
-  unsigned int GetMaxArraySize() const noexcept { return fMaxArraySize; }             // 0: unbounded, or not an array
+  bool IsReference() const noexcept { return fType == TCIMType::kCIMTypeReference; }    // an array of references is not one
+  unsigned int GetMaxArraySize() const noexcept { return fMaxArraySize; }               // 0: unbounded, or not an array
   boost::shared_ptr<ICIMClass> GetReferencedClass() const { return fReferencedClass; }  // may be empty
 
   // ---- Conversions. Each throws kZEPStatusValueIsNULL for a NULL value, else kZEPStatusTypeMismatch unless the tag is

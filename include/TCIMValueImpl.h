@@ -15,7 +15,7 @@ namespace NQRVZEP20 {
 // TCIMValue and seldom meet this class.
 class ZEP_EXPORT TCIMValueImpl {
 public:
-  virtual ~TCIMValueImpl();
+  virtual ~TCIMValueImpl() = default;
 
   virtual operator bool() const;
   virtual operator unsigned char() const;

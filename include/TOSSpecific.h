@@ -101,7 +101,8 @@ public:
   // ---- Console, time and host probes (TOSSpecificConsole.cpp) ----
 
   // Now, as local time to the millisecond. The UTC offset is that of the zone's standard time, plus 60 while daylight
-  // saving is in force (60 also where the zone shifts by another amount). TZ is looked at on each call.
+  // saving is in force: 60 also where the zone shifts by half an hour or, as Ireland does in winter, backwards. TZ is
+  // looked at on each call.
   static TCIMDateTime GetLocalTime();
 
   // Whether a key waits on standard input; also true when asking fails. Never blocks. The local modes of the terminal
@@ -238,8 +239,12 @@ public:
 
   // ---- Machine identification (TOSSpecificMachine.cpp) ----
   //
-  // Read from SMBIOS through the platform library libsmbios.so. What cannot be read is the operation's default, with the
-  // reason in the log at debug severity; nothing throws.
+  // Read from SMBIOS, afresh by each call, through the platform library libsmbios.so, which is loaded when first needed.
+  // What cannot be read is the operation's default, with the reason in the log at debug severity; nothing throws.
+  //
+  // The product description "Server Q100 -[1234AB7]-" is cut at its first "-", wherever that stands: the name is "Server
+  // Q100 " with its blank, the type "1234", the model "AB7". A bare "1234AB7" gives the type alone. A type or model that
+  // is not there in full is not given in part.
 
   // One field of SMBIOS type 1 by key, which is case-sensitive: "type" (machine type, else "0000"), "name" (else
   // "Unknown"), "model" (else "Unknown"), "SN" (serial number, else "Unknown"). Any other key: "error param of
@@ -254,11 +259,12 @@ public:
   // The machine type that the BIOS build prefix stands for, else what GetMachineType gives.
   static std::string GetMachineTypeFromID();
 
-  // The first two characters of the BIOS version of SMBIOS type 0, taken out of its brackets; else "00".
+  // The first two characters of the BIOS version of SMBIOS type 0, taken out of its brackets; "00" when there are no two.
   static std::string GetBiosID();
 
   // Copies string `number` (1 is the first) of an SMBIOS string set of `length` bytes into `output`, which has room for
   // it and was cleared by the caller: for number 1 without, for later ones with its zero byte. 1 when found, 0 otherwise.
+  // The empty string that closes the set is none of its strings. Reads no byte behind `length`.
   static int getBIDString(char* stringSet, char* output, int length, int number);
 
   // ---- Log (TOSSpecificLog.cpp) ----

@@ -4,8 +4,10 @@
 #include "os/MachineIdentity.h"
 #include "os/SmbiosLibrary.h"
 
-#include <algorithm>
+#include <memory>
 #include <new>
+#include <optional>
+#include <string_view>
 
 namespace NQRVZEP20 {
 namespace {
@@ -95,9 +97,10 @@ constexpr TBiosVersionMessages kGetMachineTypeFromIDMessages = {
 
 // The BIOS version in the structure of type 0 that the buffer holds; empty when it is not in the part looked at.
 std::string BiosVersionIn(char* buffer) {
-  char* const stringSet = buffer + static_cast<unsigned char>(buffer[1]);
-  char version[kBiosStringArea + 1] = {};
-  TOSSpecific::getBIDString(stringSet, version, kBiosStringArea, static_cast<unsigned char>(buffer[kBiosVersion]));
+  const std::size_t formattedLength = static_cast<unsigned char>(buffer[1]);
+  if (formattedLength <= kBiosVersion) return {};
+  char version[kBiosStringArea] = {};
+  TOSSpecific::getBIDString(buffer + formattedLength, version, kBiosStringArea, static_cast<unsigned char>(buffer[kBiosVersion]));
   return CleanBiosVersion(version);
 }
 

@@ -133,8 +133,8 @@ TNumber ReadNumber(std::string_view text) {
     return ReadInteger<TNumber>(text);
 }
 
-#define ZEP_NUMBER_TEXT(TNumber)                          \
-  template std::string TextOf(TNumber, unsigned char);    \
+#define ZEP_NUMBER_TEXT(TNumber)                       \
+  template std::string TextOf(TNumber, unsigned char); \
   template TNumber ReadNumber<TNumber>(std::string_view);
 
 ZEP_NUMBER_TEXT(bool)

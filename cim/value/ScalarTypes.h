@@ -24,22 +24,38 @@ template <class TFunction>
 auto OnScalarType(TCIMValue::TCIMType::ECIMType type, TFunction const& function) {
   using TType = TCIMValue::TCIMType;
   switch (type) {
-    case TType::kCIMTypeBoolean: return function(TScalarType<bool, TCIMNumericValueImpl>());
-    case TType::kCIMTypeUint8: return function(TScalarType<unsigned char, TCIMNumericValueImpl>());
-    case TType::kCIMTypeSint8: return function(TScalarType<signed char, TCIMNumericValueImpl>());
-    case TType::kCIMTypeUint16: return function(TScalarType<unsigned short, TCIMNumericValueImpl>());
-    case TType::kCIMTypeSint16: return function(TScalarType<short, TCIMNumericValueImpl>());
-    case TType::kCIMTypeUint32: return function(TScalarType<unsigned int, TCIMNumericValueImpl>());
-    case TType::kCIMTypeSint32: return function(TScalarType<int, TCIMNumericValueImpl>());
-    case TType::kCIMTypeUint64: return function(TScalarType<unsigned long, TCIMNumericValueImpl>());
-    case TType::kCIMTypeSint64: return function(TScalarType<long, TCIMNumericValueImpl>());
-    case TType::kCIMTypeReal32: return function(TScalarType<float, TCIMNumericValueImpl>());
-    case TType::kCIMTypeReal64: return function(TScalarType<double, TCIMNumericValueImpl>());
-    case TType::kCIMTypeChar16: return function(TScalarType<TCIMChar16, TCIMChar16ValueImpl>());
-    case TType::kCIMTypeString: return function(TScalarType<std::string, TCIMStringValueImpl>());
-    case TType::kCIMTypeDateTime: return function(TScalarType<TCIMDateTime, TCIMDateTimeValueImpl>());
-    case TType::kCIMTypeReference: return function(TScalarType<TCIMReference, TCIMReferenceValueImpl>());
-    default: throw TZEPException(kZEPStatusTypeMismatch);
+    case TType::kCIMTypeBoolean:
+      return function(TScalarType<bool, TCIMNumericValueImpl>());
+    case TType::kCIMTypeUint8:
+      return function(TScalarType<unsigned char, TCIMNumericValueImpl>());
+    case TType::kCIMTypeSint8:
+      return function(TScalarType<signed char, TCIMNumericValueImpl>());
+    case TType::kCIMTypeUint16:
+      return function(TScalarType<unsigned short, TCIMNumericValueImpl>());
+    case TType::kCIMTypeSint16:
+      return function(TScalarType<short, TCIMNumericValueImpl>());
+    case TType::kCIMTypeUint32:
+      return function(TScalarType<unsigned int, TCIMNumericValueImpl>());
+    case TType::kCIMTypeSint32:
+      return function(TScalarType<int, TCIMNumericValueImpl>());
+    case TType::kCIMTypeUint64:
+      return function(TScalarType<unsigned long, TCIMNumericValueImpl>());
+    case TType::kCIMTypeSint64:
+      return function(TScalarType<long, TCIMNumericValueImpl>());
+    case TType::kCIMTypeReal32:
+      return function(TScalarType<float, TCIMNumericValueImpl>());
+    case TType::kCIMTypeReal64:
+      return function(TScalarType<double, TCIMNumericValueImpl>());
+    case TType::kCIMTypeChar16:
+      return function(TScalarType<TCIMChar16, TCIMChar16ValueImpl>());
+    case TType::kCIMTypeString:
+      return function(TScalarType<std::string, TCIMStringValueImpl>());
+    case TType::kCIMTypeDateTime:
+      return function(TScalarType<TCIMDateTime, TCIMDateTimeValueImpl>());
+    case TType::kCIMTypeReference:
+      return function(TScalarType<TCIMReference, TCIMReferenceValueImpl>());
+    default:
+      throw TZEPException(kZEPStatusTypeMismatch);
   }
 }
 

@@ -33,20 +33,6 @@ void Require(bool sameType) {
 
 }  // namespace
 
-TCIMNumericValueImpl::TCIMNumericValueImpl(bool value) noexcept : fType(TType::kCIMTypeBoolean), fBoolean(value) {}
-TCIMNumericValueImpl::TCIMNumericValueImpl(unsigned char value) noexcept : fType(TType::kCIMTypeUint8), fUint8(value) {}
-TCIMNumericValueImpl::TCIMNumericValueImpl(signed char value) noexcept : fType(TType::kCIMTypeSint8), fSint8(value) {}
-TCIMNumericValueImpl::TCIMNumericValueImpl(unsigned short value) noexcept : fType(TType::kCIMTypeUint16), fUint16(value) {}
-TCIMNumericValueImpl::TCIMNumericValueImpl(short value) noexcept : fType(TType::kCIMTypeSint16), fSint16(value) {}
-TCIMNumericValueImpl::TCIMNumericValueImpl(unsigned int value) noexcept : fType(TType::kCIMTypeUint32), fUint32(value) {}
-TCIMNumericValueImpl::TCIMNumericValueImpl(int value) noexcept : fType(TType::kCIMTypeSint32), fSint32(value) {}
-TCIMNumericValueImpl::TCIMNumericValueImpl(unsigned long value) noexcept : fType(TType::kCIMTypeUint64), fUint64(value) {}
-TCIMNumericValueImpl::TCIMNumericValueImpl(long value) noexcept : fType(TType::kCIMTypeSint64), fSint64(value) {}
-TCIMNumericValueImpl::TCIMNumericValueImpl(float value) noexcept : fType(TType::kCIMTypeReal32), fReal32(value) {}
-TCIMNumericValueImpl::TCIMNumericValueImpl(double value) noexcept : fType(TType::kCIMTypeReal64), fReal64(value) {}
-TCIMNumericValueImpl::TCIMNumericValueImpl(TCIMNumericValueImpl const& other) = default;
-TCIMNumericValueImpl::~TCIMNumericValueImpl() = default;
-
 TCIMNumericValueImpl::operator bool() const {
   Require(fType == TType::kCIMTypeBoolean);
   return fBoolean;
@@ -101,7 +87,6 @@ TCIMNumericValueImpl::operator double() const {
   Require(fType == TType::kCIMTypeReal64);
   return fReal64;
 }
-
 
 std::string TCIMNumericValueImpl::ToString(unsigned char radix) const {
   if (radix != 10 && radix != 16 && radix != 8) throw TZEPException(kZEPStatusNotSupported);

@@ -10,8 +10,6 @@ namespace {
 
 }  // namespace
 
-TCIMValueImpl::~TCIMValueImpl() = default;
-
 TCIMValueImpl::operator bool() const { Refuse(); }
 TCIMValueImpl::operator unsigned char() const { Refuse(); }
 TCIMValueImpl::operator signed char() const { Refuse(); }

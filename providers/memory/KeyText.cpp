@@ -1,7 +1,7 @@
-#include "providers/memory/KeyText.h"
+#include "KeyText.h"
 
+#include "CIMNames.h"
 #include "ICIMClass.h"
-#include "providers/memory/CIMNames.h"
 
 #include <map>
 

@@ -1,9 +1,9 @@
-#include "providers/memory/TMemoryClass.h"
+#include "TMemoryClass.h"
 
-#include "providers/memory/CIMTypes.h"
-#include "providers/memory/FillLog.h"
-#include "providers/memory/KeyText.h"
-#include "providers/memory/TMemoryNamespace.h"
+#include "CIMTypes.h"
+#include "FillLog.h"
+#include "KeyText.h"
+#include "TMemoryNamespace.h"
 
 namespace NQRVZEP20 {
 
@@ -134,6 +134,7 @@ boost::shared_ptr<TMemoryInstance> TMemoryClass::FindInstance(TCIMReference cons
 }
 
 void TMemoryClass::Empty() {
+  for (auto const& instance : fInstances) instance->DropReferences();
   fInstancesByKeys.clear();
   fInstances.clear();
   fLayout.reset();

@@ -1,10 +1,10 @@
 #pragma once
 
 #include "ICIMClass.h"
-#include "providers/memory/TMemoryInstance.h"
-#include "providers/memory/TMemoryMethodDecl.h"
-#include "providers/memory/TMemoryNamedElement.h"
-#include "providers/memory/TMemoryPropertyDecl.h"
+#include "TMemoryInstance.h"
+#include "TMemoryMethodDecl.h"
+#include "TMemoryNamedElement.h"
+#include "TMemoryPropertyDecl.h"
 
 #include <string>
 #include <unordered_map>

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "TCIMValue.h"
-#include "providers/memory/TMemoryType.h"
+#include "TMemoryType.h"
 
 #include <boost/shared_ptr.hpp>
 

@@ -1,9 +1,9 @@
 #pragma once
 
 #include "ICIMNamespace.h"
+#include "TMemoryQualifier.h"
+#include "TNamedList.h"
 #include "TZEPException.h"
-#include "providers/memory/TMemoryQualifier.h"
-#include "providers/memory/TNamedList.h"
 
 #include <boost/enable_shared_from_this.hpp>
 #include <boost/make_shared.hpp>

@@ -8,6 +8,7 @@
 #include <cstdio>
 #include <map>
 #include <memory>
+#include <regex>
 #include <set>
 
 namespace NQRVZEP20 {
