@@ -200,9 +200,7 @@ void TCIMReferenceImpl::SetClassName(std::string const& name) {
   LookUpClass(*ns, name);
 }
 
-void TCIMReferenceImpl::LookUpClass(ICIMNamespace const& ns, std::string const& name) {
-  SetClass(ns.GetClass(name, fContext));
-}
+void TCIMReferenceImpl::LookUpClass(ICIMNamespace const& ns, std::string const& name) { SetClass(ns.GetClass(name, fContext)); }
 
 void TCIMReferenceImpl::AddKeyValue(std::string const& name, TCIMValue const& value) {
   if (!fClass) throw TZEPException(kZEPStatusInvalidOpSequence);

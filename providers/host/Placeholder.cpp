@@ -61,6 +61,7 @@ constexpr std::string_view kPlaceholders[] = {
     "0123456789",
     "0123456789abcdef",
     "part number",
+    "03000200-0400-0500-0006-000700080009",
 };
 
 // Followed by the number of the memory slot: "Manufacturer0", "PartNum3".

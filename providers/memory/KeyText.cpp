@@ -2,6 +2,7 @@
 
 #include "CIMNames.h"
 #include "ICIMClass.h"
+#include "TZEPException.h"
 
 #include <map>
 
@@ -9,8 +10,17 @@ namespace NQRVZEP20 {
 
 namespace {
 
+// A value that holds a NULL char16 or datetime cannot be printed; its text is empty, as that of no other char16 or datetime.
+std::string PlainText(TCIMValue const& value) {
+  try {
+    return value.ToString();
+  } catch (TZEPException const&) {
+    return "";
+  }
+}
+
 std::string ValueText(TCIMValue const& value) {
-  if (!value.IsReference()) return value.ToString();
+  if (!value.IsReference()) return PlainText(value);
   const TCIMReference path = value;
   const boost::shared_ptr<ICIMClass> cls = path.GetClass();
   return (cls ? FoldName(cls->GetName(TCIMContext())) : std::string()) + "." + KeyText(path);

@@ -112,7 +112,8 @@ void TMemoryClass::CommitInstance(boost::shared_ptr<ICIMInstance> instance, TCIM
 
 boost::shared_ptr<TMemoryInstance> TMemoryClass::AddInstance(TMemoryValues const& values) {
   const TCIMContext none;
-  const auto instance = boost::static_pointer_cast<TMemoryInstance>(CreateInstance(none));
+  const auto created = NameRefusal(Name(), "", [&] { return CreateInstance(none); });
+  const auto instance = boost::static_pointer_cast<TMemoryInstance>(created);
   for (auto const& entry : values) NameRefusal(Name(), entry.first, [&] { instance->Set(entry.first, entry.second); });
   NameRefusal(Name(), "", [&] { CommitInstance(instance, none); });
   return instance;

@@ -27,7 +27,6 @@ public:
     VisitEach(fQualifiers.Elements(), callback);
   }
 
-  // Throws kZEPStatusNotFound when the declaration is not one of this element's namespace.
   boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                 unsigned int flavor, TCIMContext const& context) override {
     const std::string name = declaration->GetName(context);

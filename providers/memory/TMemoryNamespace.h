@@ -24,7 +24,8 @@ class TMemoryQualifierDecl;
 //
 // Always held by boost::shared_ptr. It owns everything in it and lets go of everything when it goes: a class that someone
 // still holds then is empty, an instance keeps its values but for references, and what looks for the namespace, or for a
-// class that nobody holds, throws boost::bad_weak_ptr. Lookups by name and by object path take constant time. Contexts are ignored.
+// class that nobody holds, throws boost::bad_weak_ptr. Lookups by name and by object path take constant time. Contexts are
+// ignored. Several threads may read at once while none writes.
 class TMemoryNamespace : public ICIMNamespace, public boost::enable_shared_from_this<TMemoryNamespace> {
 public:
   // Empty: without classes and without qualifier declarations.

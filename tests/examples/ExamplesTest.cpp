@@ -8,6 +8,8 @@
 
 #include <cstdio>
 #include <memory>
+#include <regex>
+#include <sstream>
 
 namespace NQRVZEP20 {
 namespace {
@@ -60,6 +62,24 @@ TEST_F(ClockTest, AssociatesClocks) {
   EXPECT_TRUE(associations[0]->GetClass(kNone)->GetClassFlag(kNone));
 }
 
+// ---- The programs ----
+
+std::string OutputOf(std::string const& command) {
+  std::unique_ptr<FILE, int (*)(FILE*)> const pipe(::popen(command.c_str(), "r"), ::pclose);
+  std::string output;
+  for (int c; (c = std::fgetc(pipe.get())) != EOF;) output += static_cast<char>(c);
+  return output;
+}
+
+TEST(ReadmeExampleTest, PrintsTheMachineTypeAndModelOfTheSample) {
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", ZEP_SOURCE_DIR "/tools/zep/sample/smbios.bin");
+  EXPECT_EQ(OutputOf(ZEP_README_EXAMPLE), "1234AB7\n");
+}
+
+TEST(ListProviderTest, EndsInTheStatusOfAPlugInThatDoesNotLoad) {
+  EXPECT_EQ(OutputOf(ZEP_LIST_PROVIDER " /nowhere/libNone.nsp.so 2>&1; echo $?"), "kZEPStatusFileSystemError\n1\n");
+}
+
 // ---- The documentation ----
 
 struct TBlock {
@@ -104,17 +124,14 @@ void ExpectBlocksFrom(std::string const& document, std::string const& language, 
   EXPECT_EQ(found, count);
 }
 
+TEST(DocumentationTest, ReadmeShowsTheCodeOfTheExample) {
+  ExpectBlocksFrom("README.md", "cpp", "examples/ReadmeExample.cpp", 1);
+}
+
 TEST(DocumentationTest, WalkThroughShowsTheCodeOfTheExample) {
   ExpectBlocksFrom("docs/writing-a-provider.md", "cpp", "examples/Clock/Clock.cpp", 6);
   ExpectBlocksFrom("docs/writing-a-provider.md", "cmake", "examples/Clock/CMakeLists.txt", 1);
   EXPECT_EQ(FirstBlockOf("docs/writing-a-provider.md", "cmake"), SourceFile("examples/Clock/CMakeLists.txt"));
-}
-
-std::string OutputOf(std::string const& command) {
-  std::unique_ptr<FILE, int (*)(FILE*)> const pipe(::popen(command.c_str(), "r"), ::pclose);
-  std::string output;
-  for (int c; (c = std::fgetc(pipe.get())) != EOF;) output += static_cast<char>(c);
-  return output;
 }
 
 // Clocks run on: every number behind " = " is as good as another.

@@ -94,6 +94,35 @@ TEST(HouseTest, EveryPublicHeaderIsInTheOneThatIncludesThemAll) {
   }
 }
 
+// Every test of the tree, as "Suite.Name".
+std::set<std::string> AllTests() {
+  static std::regex const test(R"(^TEST(?:_F|_P)?\((\w+), (\w+)\))");
+  std::set<std::string> tests;
+  for (auto const& entry : fs::recursive_directory_iterator(kSource / "tests")) {
+    if (entry.path().extension() != ".cpp") continue;
+    std::ifstream file(entry.path());
+    std::smatch match;
+    for (std::string line; std::getline(file, line);)
+      if (std::regex_search(line, match, test)) tests.insert(match[1].str() + "." + match[2].str());
+  }
+  return tests;
+}
+
+TEST(HouseTest, EveryKeptBehaviourNamesAFileAndATestThatExist) {
+  static std::regex const row(R"(^\| .* \| `([^`]+)` \| `([^`]+)` \|$)");
+  std::set<std::string> const tests = AllTests();
+  std::istringstream lines(ReadFile((kSource / "docs/kept-behaviour.md").string()));
+  int rows = 0;
+  std::smatch match;
+  for (std::string line; std::getline(lines, line);) {
+    if (!std::regex_match(line, match, row)) continue;
+    EXPECT_TRUE(fs::exists(kSource / match[1].str())) << match[1];
+    EXPECT_TRUE(tests.count(match[2])) << match[2];
+    ++rows;
+  }
+  EXPECT_GT(rows, 20);
+}
+
 std::string OutputOf(std::string const& command) {
   std::unique_ptr<FILE, int (*)(FILE*)> const pipe(::popen(command.c_str(), "r"), ::pclose);
   std::string output;

@@ -1,5 +1,6 @@
 #include "PlugIns.h"
 
+#include "Failure.h"
 #include "ILogger.h"
 #include "INamespaceProvider.h"
 #include "Output.h"
@@ -8,7 +9,6 @@
 
 #include <algorithm>
 #include <chrono>
-#include <exception>
 #include <filesystem>
 #include <map>
 #include <stdexcept>
@@ -28,20 +28,13 @@ TProviders RegisteredProviders() {
   return providers;
 }
 
-// Runs `work` and returns why it failed, or an empty text. A plug-in may throw anything.
+// As FailureOf, and how long it took.
 template <class TWork>
-std::string ErrorOf(TWork work, double& milliseconds) {
+std::string TimedFailureOf(TWork work, double& milliseconds) {
   auto const start = std::chrono::steady_clock::now();
-  std::string error;
-  try {
-    work();
-  } catch (std::exception const& failure) {
-    error = failure.what();
-  } catch (...) {
-    error = "it threw something that is no exception of the standard library";
-  }
+  std::string failure = FailureOf(work);
   milliseconds = std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() - start).count();
-  return error;
+  return failure;
 }
 
 // The dynamic linker's reason, which the library writes to the log before it throws.
@@ -62,14 +55,14 @@ TProviderRun Ask(std::string const& name, boost::shared_ptr<INamespaceProvider> 
     if (!ns) throw std::runtime_error("it has no namespace");
     run.fView = std::make_shared<TNamespaceView>(name, ns);
   };
-  run.fError = ErrorOf(fill, run.fMilliseconds);
+  run.fError = TimedFailureOf(fill, run.fMilliseconds);
   return run;
 }
 
 TPlugIn Load(std::string const& name) {
   TPlugIn plugIn{name, PlugInDirectory() + TOSSpecific::kFileSeparator + "lib" + name + kNSPExtension, 0, "", {}};
   TProviders const before = RegisteredProviders();
-  plugIn.fError = ErrorOf([&] { TOSSpecific::LoadNSPLibrary(name); }, plugIn.fMilliseconds);
+  plugIn.fError = TimedFailureOf([&] { TOSSpecific::LoadNSPLibrary(name); }, plugIn.fMilliseconds);
   if (!plugIn.fError.empty()) plugIn.fError = LinkerReason(name, plugIn.fError);
 
   for (auto const& [providerName, provider] : RegisteredProviders())

@@ -1,5 +1,6 @@
 #include "Report.h"
 
+#include "Failure.h"
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
 #include "ICIMProperty.h"
@@ -10,7 +11,6 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
-#include <exception>
 #include <map>
 
 namespace NQRVZEP20::zep {
@@ -43,9 +43,9 @@ TQuestion const kIdentity[] = {
     {"model", "Model", kSystem, "ProductName", TCIMSchemaHelper::GetModelNumber},
     {"serialNumber", "Serial number", kSystem, "SerialNumber",
      [](TNamespacePtr ns) { return TCIMSchemaHelper::GetSerialNumber(ns, TCIMContext()); }},
-    {"osName", "System", kOperatingSystem, "Name", TCIMSchemaHelper::GetOperatingSystemName},
-    {"osVersion", "System version", kOperatingSystem, "Version", TCIMSchemaHelper::GetOperatingSystemVersion},
-    {"osType", "System type", kOperatingSystem, "OSType", TCIMSchemaHelper::GetOperatingSystemType},
+    {"osName", "OS", kOperatingSystem, "Name", TCIMSchemaHelper::GetOperatingSystemName},
+    {"osVersion", "OS version", kOperatingSystem, "Version", TCIMSchemaHelper::GetOperatingSystemVersion},
+    {"osType", "OS type", kOperatingSystem, "OSType", TCIMSchemaHelper::GetOperatingSystemType},
     {"collectorVersion", "zepcore version", kProduct, "Version",
      [](TNamespacePtr ns) { return TCIMSchemaHelper::GetDataSourceVersion(ns, TCIMContext()); }},
     {"collectorBuild", "zepcore build", kProduct, "Build",
@@ -81,7 +81,7 @@ TAnswer AskForModel(TNamespaceView const& view, TQuestion const& question) {
 }
 
 TMissing WhyNobodyAnswers(std::vector<TPlugIn> const& plugIns) {
-  if (plugIns.empty()) return {kMissingNotDescribed, "there is no provider plug-in in " + PlugInDirectory()};
+  if (plugIns.empty()) return {kMissingNotDescribed, "no provider plug-in found"};
   return {kMissingNotDescribed, "no provider plug-in works"};
 }
 
@@ -90,13 +90,12 @@ template <class TAsk>
 TAnswer AskEveryone(TViews const& views, std::vector<TPlugIn> const& plugIns, TAsk ask) {
   TAnswer best = TAnswer::Unknown(WhyNobodyAnswers(plugIns), "");
   for (TNamespaceView const& view : views) {
-    try {
-      TAnswer const answer = ask(view);
-      if (answer.fIsKnown) return answer;
-      if (best.fMissing.fCode == kMissingNotDescribed) best = answer;
-    } catch (std::exception const& failure) {
-      best = TAnswer::Unknown({kMissingProviderFailed, "provider " + view.GetProviderName() + " failed: " + failure.what()}, "");
-    }
+    TAnswer answer = TAnswer::Unknown({}, "");
+    std::string const failure = FailureOf([&] { answer = ask(view); });
+    if (!failure.empty())
+      answer = TAnswer::Unknown({kMissingProviderFailed, "provider " + view.GetProviderName() + " failed: " + failure}, "");
+    if (answer.fIsKnown) return answer;
+    if (best.fMissing.fCode == kMissingNotDescribed) best = answer;
   }
   return best;
 }

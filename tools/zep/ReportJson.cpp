@@ -1,3 +1,4 @@
+#include "Failure.h"
 #include "ICIMInstance.h"
 #include "Json.h"
 #include "Report.h"
@@ -50,11 +51,17 @@ TJson PlugInsAsJson(std::vector<TPlugIn> const& plugIns) {
   return json;
 }
 
-TJson InstancesAsJson(std::vector<TPlugIn> const& plugIns) {
-  TJson json = TJson::array();
-  for (TNamespaceView const& view : ViewsOf(plugIns))
-    for (auto const& instance : view.AllInstances()) json.push_back(InstanceAsJson(view, *instance));
-  return json;
+// Adds the instances of every namespace to the document, and the namespaces that failed while they were read.
+void AddInstances(TJson& document, std::vector<TPlugIn> const& plugIns) {
+  TJson& instances = document["instances"] = TJson::array();
+  TJson failures = TJson::array();
+  for (TNamespaceView const& view : ViewsOf(plugIns)) {
+    std::string const failure = FailureOf([&] {
+      for (auto const& instance : view.AllInstances()) instances.push_back(InstanceAsJson(view, *instance));
+    });
+    if (!failure.empty()) failures.push_back({{"provider", view.GetProviderName()}, {"error", failure}});
+  }
+  if (!failures.empty()) document["instanceFailures"] = failures;
 }
 
 }  // namespace
@@ -69,7 +76,7 @@ std::string ReportAsJson(TReport const& report) {
   document["details"] = RowsAsJson(report.fDetails);
   document["plugInDirectory"] = PlugInDirectory();
   document["plugIns"] = PlugInsAsJson(report.fPlugIns);
-  document["instances"] = InstancesAsJson(report.fPlugIns);
+  AddInstances(document, report.fPlugIns);
   return AsText(document);
 }
 

@@ -221,6 +221,17 @@ TEST_F(HostNamespaceTest, EmptySocketsAndSlotsHaveNoInstance) {
   EXPECT_THAT(MissingOf("CIM_Chassis"), ElementsAre(": the SMBIOS tables hold no structure of type 3 (Chassis)"));
 }
 
+TEST_F(HostNamespaceTest, AKeyThatTheFirmwareDoesNotGiveIsLeftOutOfThePath) {
+  std::string const bios = TStructureMaker(0, 0x18).Text(0x04, "Example Works").Table();
+  Fill(bios + bios + EndOfTable());
+  auto const instances = InstancesOf("CIM_BIOSElement");
+  ASSERT_EQ(instances.size(), 2u);
+  EXPECT_EQ(
+      instances[1]->GetPath(TCIMContext()).GetPath(),
+      "CIM_BIOSElement.Name=\"BIOS 1\",SoftwareElementID=\"BIOS 1\",SoftwareElementState=\"3\",TargetOperatingSystem=\"0\"");
+  EXPECT_EQ(TextOf(*instances[1], "Version"), "NULL");
+}
+
 TEST_F(HostNamespaceTest, AMangledTableFillsANamespaceAllTheSame) {
   std::string const table = RealTable("full");
   for (std::size_t length = 0; length < table.size(); length += 7) {

@@ -86,9 +86,12 @@ TEST(SystemRecordTest, PlaceholdersAndWhatIsNotGivenAreNullForTheirReason) {
                     {"Family", std::string("string ") + kNoText}});
 }
 
-TEST(SystemRecordTest, AUuidOfOnesIsStillToBeSet) {
+TEST(SystemRecordTest, AUuidThatNobodySetIsNull) {
   EXPECT_EQ(PropertyOf(SystemRecordOf(System().Bytes(0x08, std::string(16, '\xff'))), "UUID"),
             "string NULL not-given: the firmware leaves it to be set (all ones)");
+  std::string const counted = "\x00\x02\x00\x03\x00\x04\x00\x05\x00\x06\x00\x07\x00\x08\x00\x09"s;
+  EXPECT_EQ(PropertyOf(SystemRecordOf(System().Bytes(0x08, counted)), "UUID"),
+            "string NULL placeholder: placeholder text of the firmware: \"03000200-0400-0500-0006-000700080009\"");
 }
 
 TEST(SystemRecordTest, AnOldStructureHasFewerFields) {

@@ -3,7 +3,9 @@
 #include "Collect.h"
 
 #include <algorithm>
+#include <atomic>
 #include <chrono>
+#include <thread>
 
 namespace NQRVZEP20 {
 namespace {
@@ -78,6 +80,21 @@ TEST(ManyElementsTest, LookupInAHundredTimesLargerNamespaceDoesNotCostTenTimesAs
   double const inSmall = SecondsOf([&] { small.LookUp(); });
   double const inLarge = SecondsOf([&] { large.LookUp(); });
   EXPECT_LT(inLarge, 10 * inSmall);
+}
+
+TEST(ManyElementsTest, SeveralThreadsReadAtOnce) {
+  auto const ns = NewNamespace();
+  DefineClasses(*ns, 40);
+  for (int i = 0; i < 200; ++i) ns->AddInstance(NumberedName("X_Class", i % 40), {{"Id", i}});
+  std::atomic<int> found{0};
+  std::vector<std::thread> readers;
+  for (int reader = 0; reader < 4; ++reader)
+    readers.emplace_back([&] {
+      for (auto const& instance : All(*ns->GetClass("X_Class0", kNone), &ICIMClass::EnumerateInstances))
+        if (ns->GetInstance(instance->GetPath(kNone), kNone) == instance) ++found;
+    });
+  for (std::thread& reader : readers) reader.join();
+  EXPECT_EQ(found, 800);
 }
 
 }  // namespace

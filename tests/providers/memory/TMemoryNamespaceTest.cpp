@@ -290,6 +290,13 @@ TEST_F(TMemoryNamespacePathTest, KeysOfEachKindAreFoundByValue) {
   }
 }
 
+TEST_F(TMemoryNamespacePathTest, Char16KeyIsNotFoundByAPathReadFromText) {
+  ns_->DefineClass("X_Drive").Key("Letter", "char16");
+  auto const drive = ns_->AddInstance("X_Drive", {{"Letter", TCIMChar16(67)}});
+  EXPECT_EQ(ns_->GetInstance(drive->GetPath(kNone), kNone), drive);
+  EXPECT_FALSE(Find("X_Drive.Letter=\"67\""));  // a char16 that is read from text is NULL
+}
+
 TEST_F(TMemoryNamespacePathTest, DatetimesOfOneInstantInTwoZonesAreTwoKeys) {
   ns_->DefineClass("X_Event").Key("Time", "datetime");
   ns_->AddInstance("X_Event", {{"Time", TCIMDateTime("20070315140000.000000+060")}});
@@ -331,6 +338,7 @@ TEST(TMemoryNamespaceTest, RefusalIsNamedInTheLog) {
   auto const ns = NewNamespace();
   ns->DefineClass("X_Disk").Key("Id", "uint32");
   ns->AddInstance("X_Disk", {{"Id", 5}});
+  ns->DefineClass("X_Idea", "X_Disk").Abstract();
   struct {
     std::function<void()> action;
     EZEPStatusCode status;
@@ -340,6 +348,7 @@ TEST(TMemoryNamespaceTest, RefusalIsNamedInTheLog) {
       {[&] { ns->DefineClass("X-Disk"); }, kZEPStatusInvalidCIMName, "X-Disk refused: kZEPStatusInvalidCIMName"},
       {[&] { ns->DefineClass("X_Ssd", "X_Disc"); }, kZEPStatusNotFound, "X_Ssd refused: kZEPStatusNotFound"},
       {[&] { ns->AddInstance("X_Disc", {}); }, kZEPStatusNotFound, "X_Disc refused: kZEPStatusNotFound"},
+      {[&] { ns->AddInstance("X_Idea", {}); }, kZEPStatusInvalidClass, "X_Idea refused: kZEPStatusInvalidClass"},
       {[&] {
          ns->AddInstance("X_Disk", {{"Name", "a"}});
        },

@@ -128,7 +128,7 @@ TEST_F(ReportTest, EachRowHasItsValueOrItsReason) {
       {"full", "Machine type", "1234"},
       {"full", "Model", "AB7"},
       {"full", "Serial number", "KQ12345"},
-      {"full", "System type", "Linux"},
+      {"full", "OS type", "Linux"},
       {"full", "zepcore version", TEST_VERSION},
       {"full", "zepcore build", TEST_BUILD_ID},
       {"full", "Manufacturer", "Example Works"},
@@ -376,15 +376,16 @@ TEST_F(ReportTest, WithoutPlugInsNothingIsTold) {
   zep_.Remove("libHost.nsp.so");
   TRun const run = Report(RealTablePath("full"));
   EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(LinesOf(run.output)[0], "Unnamed machine: not identified: there is no provider plug-in in " + zep_.Path("lib"));
-  EXPECT_THAT(LinesOf(run.output)[1], StartsWith("Operating system: unknown: there is no provider plug-in in "));
+  EXPECT_EQ(LinesOf(run.output)[0], "Unnamed machine: not identified: no provider plug-in found");
+  EXPECT_EQ(LinesOf(run.output)[1], "Operating system: unknown: no provider plug-in found");
   for (char const* title : {"Identity", "Details"})
     for (auto const& row : ValueRowsOf(run.output, title)) {
-      EXPECT_EQ(WithoutBlanks(row[1]), WithoutBlanks("unknown: there is no provider plug-in in " + zep_.Path("lib")));
+      EXPECT_EQ(row[1], "unknown: no provider plug-in found");
       EXPECT_EQ(row[2], "none");
     }
   ASSERT_EQ(PlugInRowsOf(run.output).size(), 1u);
   EXPECT_EQ(PlugInRowsOf(run.output)[0][0], "none");
+  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(run.output)[0][2]), WithoutBlanks("no file lib*.nsp.so in " + zep_.Path("lib")));
 
   TRun const json = Report(RealTablePath("full"), {"--json"});
   EXPECT_EQ(json.status, 1);
@@ -447,11 +448,16 @@ TEST_F(ReportTest, AProviderThatFailsIsToldAndStopsNoOther) {
   }
 }
 
-TEST_F(ReportTest, ANamespaceThatFailsLaterIsToldInItsRows) {
+TEST_F(ReportTest, ANamespaceThatFailsLaterIsToldWhereItFails) {
   zep_.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("fails-later");
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: provider Test failed: kZEPStatusFail");
+
+  auto const document = JsonOf(RunWithTestProvider("fails-later", {"--json"}));
+  EXPECT_THAT(document["instances"], IsEmpty());
+  EXPECT_EQ(document["instanceFailures"][0]["provider"], "Test");
+  EXPECT_EQ(document["instanceFailures"][0]["error"], "it threw something that is no exception of the standard library");
 }
 
 TEST_F(ReportTest, APlugInThatRegistersNothingIsTold) {
@@ -476,7 +482,7 @@ TEST_F(ReportTest, TheFirstProviderThatKnowsAnswers) {
   EXPECT_EQ(run.status, 2);
   EXPECT_EQ(LinesOf(run.output)[0], "one: 1234AB7, type 1234, model AB7, serial number KQ12345");
   EXPECT_EQ(ValueRowsOf(run.output, "Identity")[0][2], "provider Test");
-  EXPECT_EQ(ValueIn(run.output, "System"), "unknown: no provider describes it");
+  EXPECT_EQ(ValueIn(run.output, "OS"), "unknown: no provider describes it");
 }
 
 TEST_F(ReportTest, TwoSystemsAreNotOneIdentity) {

@@ -80,7 +80,7 @@ void Fill(TMemoryNamespace& ns) {
   if (Does("odd")) AddOddities(ns);
 }
 
-// Fails whenever a class is asked for.
+// Fails whenever a class is asked for by name, or all of them.
 class TFailingNamespace : public TMemoryNamespace {
 public:
   using TMemoryNamespace::TMemoryNamespace;
@@ -88,6 +88,7 @@ public:
     if (name == "ZEP_MissingValue" && !Does("fails-at-once")) return TMemoryNamespace::GetClass(name, context);
     throw TZEPException(kZEPStatusFail);
   }
+  void EnumerateClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)>, TCIMContext const&) const override { throw 5; }
 };
 
 class TOwnProvider : public INamespaceProvider {
