@@ -17,6 +17,8 @@ namespace {
 constexpr TCommand kCommands[] = {
     {"report", "Tell which machine this is", AddReportArguments},
     {"show", "Print one object or class of the providers' namespaces", AddShowArguments},
+    {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},
+    {"run", "Run a command as the library runs one, and print its output", AddRunArguments},
 };
 
 int Run(int argc, char const* const* argv) {

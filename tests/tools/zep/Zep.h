@@ -30,6 +30,7 @@ struct TCall {
   bool ignoresBrokenPipes = false;  // with SIGPIPE ignored, as some callers leave it
   std::string outputFile = {};      // instead of one that is read back
   int outputDescriptor = -1;        // the same, as an open descriptor
+  std::string directory = {};       // to work in
 };
 
 class TInstallation {
@@ -70,6 +71,7 @@ private:
     if (!RedirectTo(call.outputFile.empty() ? Path("out") : call.outputFile, STDOUT_FILENO)) ::_exit(126);
     if (call.outputDescriptor >= 0) ::dup2(call.outputDescriptor, STDOUT_FILENO);
     if (!RedirectTo(Path("err"), STDERR_FILENO)) ::_exit(126);
+    if (!call.directory.empty() && ::chdir(call.directory.c_str()) != 0) ::_exit(126);
     std::signal(SIGPIPE, call.ignoresBrokenPipes ? SIG_IGN : SIG_DFL);
     for (char const* name : {"ZEP_SMBIOS_TABLE", "ZEP_HOST_NAME", "LD_LIBRARY_PATH"}) ::unsetenv(name);
     for (auto const& [name, value] : call.environment) ::setenv(name.c_str(), value.c_str(), 1);
