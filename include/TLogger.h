@@ -61,6 +61,7 @@ public:
   // dropped. Records severities up to kLogStatus (negative ones too) and the two memory-only ones in the list; writes the
   // others to this thread's file, if it has one:
   //   FDR_[Status] 3/3/2024  9:5:7 message
+  // A zero byte in the message ends the written line there, without a newline; the list has the whole message.
   // Throws kZEPStatusFail when a file is open and the severity is none of kLogError to kLogVerbose. Failing writes go
   // unnoticed.
   void OutputLogEntry(EZEPLogSeverity severity, std::string const& message) override;
