@@ -183,7 +183,7 @@ template <class TNumber>
 std::string StreamText(TNumber number, int radix = 10) {
   std::ostringstream stream;
   stream.imbue(std::locale::classic());
-  stream << std::setbase(radix) << std::uppercase << std::setfill('0') << std::setw(radix == 16 ? 2 * sizeof number : 0)
+  stream << std::setbase(radix) << (radix == 16 ? std::uppercase : std::nouppercase) << std::setfill('0') << std::setw(radix == 16 ? 2 * sizeof number : 0)
          << +number;
   return stream.str();
 }
