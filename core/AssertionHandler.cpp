@@ -6,6 +6,7 @@
 
 #include <cstdio>
 #include <cstdlib>
+#include <locale>
 #include <sstream>
 
 namespace NQRVZEP20 {
@@ -14,6 +15,7 @@ namespace {
 // A null pointer puts the stream into its error state: the rest of the message is dropped.
 std::string MessageOf(char const* expr, char const* function, char const* file, long line) {
   std::ostringstream message;
+  message.imbue(std::locale::classic());
   message << "Boost assertion failure! " << file << ":" << line << " [" << expr << "] func = " << function;
   return message.str();
 }

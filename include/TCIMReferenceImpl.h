@@ -67,6 +67,7 @@ private:
   std::map<std::string, TCIMValue> fKeys;   // by name, in byte order
   boost::shared_ptr<ICIMElement> fElement;  // the instance, once found; never looked up again
   std::string fNamespaceName;               // the caller's label; has nothing to do with fNamespace
+  int fDepth = 0;                           // how many paths that are being read this one stands in
 };
 
 }  // namespace NQRVZEP20

@@ -16,6 +16,7 @@ namespace NQRVZEP20 {
 
 class ICIMClass;
 class ICIMNamespace;
+class TCIMNumericValueImpl;
 class TCIMReference;
 class TCIMValueImpl;
 
@@ -148,7 +149,7 @@ public:
 
   // ---- Queries ----
 
-  bool IsNull() const noexcept { return !fImpl; }
+  bool IsNull() const noexcept { return !fData; }
   TCIMType GetType() const noexcept { return fType; }
   bool IsArray() const noexcept { return (fType & TCIMType::kCIMTypeArrayFlag) != 0; }
   bool IsReference() const noexcept { return fType == TCIMType::kCIMTypeReference; }    // an array of references is not one
@@ -196,12 +197,38 @@ public:
 private:
   friend class TCIMValueImpl;
 
-  TCIMValueImpl const& Data(TCIMType required) const;
-  void SetData(TCIMType type, std::unique_ptr<TCIMValueImpl> data);
+  // Owns the data of one value. A number, the smallest and most frequent kind, lies in the value itself and costs no
+  // allocation; every other kind is on the heap.
+  class TData {
+  public:
+    TData() noexcept : fImpl(nullptr) {}
+    explicit TData(TCIMNumericValueImpl const& number) noexcept;
+    explicit TData(std::unique_ptr<TCIMValueImpl> data) noexcept;
+    static TData CopyOf(TCIMType type, TData const& other);  // `type`: that of the value which holds `other`
+    TData(TData&& other) noexcept;
+    TData& operator=(TData&& other) noexcept;
+    ~TData();
+
+    explicit operator bool() const noexcept { return fImpl != nullptr; }
+    TCIMValueImpl const& operator*() const noexcept { return *fImpl; }
+    TCIMValueImpl const* operator->() const noexcept { return fImpl; }
+
+  private:
+    bool IsInPlace() const noexcept;
+    void Take(TData& other) noexcept;
+
+    TCIMValueImpl* fImpl;  // null, the number in fPlace, or on the heap and owned
+    alignas(void*) unsigned char fPlace[24];
+  };
+
+  TCIMValue(TCIMType type, TData data) noexcept;
+
+  TCIMValueImpl const& DataAs(TCIMType required) const;
+  void SetData(TCIMType type, TData data) noexcept;
   void TakeFrom(TCIMValue& other) noexcept;
 
   TCIMType fType;
-  std::unique_ptr<TCIMValueImpl> fImpl;  // null means the value is NULL; never shared
+  TData fData;  // none means the value is NULL; never shared
   boost::shared_ptr<ICIMClass> fReferencedClass;
   unsigned int fMaxArraySize;
 };

@@ -11,6 +11,7 @@
 namespace NQRVZEP20 {
 
 class INamespaceConsumer;
+class TPluginManagerProvider;  // the host's handle for the machine-identification library; only ever handed on
 
 // ".nsp.so", the ending of every namespace provider library.
 ZEP_EXPORT extern std::string const kNSPExtension;

@@ -78,7 +78,8 @@ std::string TOSSpecific::GetZEPRootPath() {
   std::string const path = file;
   // Refused rather than cut short: what is left of a longer name would name another directory.
   if (path.size() > kLongestFileName) throw TZEPException(kZEPStatusFileSystemError);
-  return path.substr(0, path.rfind(kFileSeparator));
+  std::size_t const separator = path.rfind(kFileSeparator);
+  return separator == path.npos ? "." : path.substr(0, separator);  // a bare name was found in the working directory
 }
 
 std::vector<std::string> TOSSpecific::FindPlugins(std::string root, std::string kind) {

@@ -15,6 +15,7 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr std::size_t kNowhere = std::string::npos;
+constexpr int kMaxDepth = 100;  // of references among the keys of references; a path comes from outside
 
 [[noreturn]] void ThrowInvalidReference(std::string_view reason, std::string const& path) {
   LogError(reason, path);
@@ -181,7 +182,9 @@ boost::shared_ptr<ICIMPropertyDecl const> TCIMReferenceImpl::ReadDeclaration(std
 // Reads a path between quotes, which are not escaped inside it; `pos` goes from the opening to the closing quote.
 TCIMValue TCIMReferenceImpl::ReadReference(boost::shared_ptr<ICIMNamespace> const& ns, std::string const& path,
                                            std::size_t& pos) const {
+  if (fDepth == kMaxDepth) ThrowInvalidReference("Reference nested too deeply, path=", path);
   TCIMReference reference(ns, fContext);
+  reference.GetBody()->fDepth = fDepth + 1;
   ParsePath(*reference.GetBody(), path, pos);
   return TCIMValue(reference);
 }
@@ -200,7 +203,12 @@ void TCIMReferenceImpl::SetClassName(std::string const& name) {
   LookUpClass(*ns, name);
 }
 
-void TCIMReferenceImpl::LookUpClass(ICIMNamespace const& ns, std::string const& name) { SetClass(ns.GetClass(name, fContext)); }
+// An unknown class, too, may be reported by an empty pointer. Both throw kZEPStatusNotFound here.
+void TCIMReferenceImpl::LookUpClass(ICIMNamespace const& ns, std::string const& name) {
+  boost::shared_ptr<ICIMClass> cls = ns.GetClass(name, fContext);
+  if (!cls) throw TZEPException(kZEPStatusNotFound);
+  SetClass(std::move(cls));
+}
 
 void TCIMReferenceImpl::AddKeyValue(std::string const& name, TCIMValue const& value) {
   if (!fClass) throw TZEPException(kZEPStatusInvalidOpSequence);

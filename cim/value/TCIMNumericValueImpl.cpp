@@ -1,8 +1,8 @@
 #include "TCIMNumericValueImpl.h"
 
-#include "cim/value/NumberText.h"
 #include "cim/value/ScalarTypes.h"
 
+#include <charconv>
 #include <type_traits>
 
 namespace NQRVZEP20 {
@@ -10,6 +10,39 @@ namespace NQRVZEP20 {
 using TType = TCIMValue::TCIMType;
 
 namespace {
+
+// What std::to_chars writes into a buffer, as a string.
+template <class... TArguments>
+std::string ToChars(TArguments... arguments) {
+  char buffer[24];  // a uint64 in base 8 has 22 digits
+  char* const end = std::to_chars(buffer, buffer + sizeof buffer, arguments...).ptr;
+  return std::string(buffer, end);
+}
+
+std::string HexText(unsigned long number, std::size_t width) {
+  std::string text(width, '0');
+  for (auto digit = text.rbegin(); digit != text.rend(); ++digit, number >>= 4) *digit = "0123456789ABCDEF"[number & 0xF];
+  return text;
+}
+
+void RequireDecimal(unsigned char radix) {
+  if (radix != 10) throw TZEPException(kZEPStatusNotSupported);
+}
+
+template <class TNumber>
+std::string TextOf(TNumber number, unsigned char radix) {
+  if constexpr (std::is_same_v<TNumber, bool>) {
+    return number ? "true" : "false";
+  } else if constexpr (std::is_floating_point_v<TNumber>) {
+    RequireDecimal(radix);
+    return ToChars(static_cast<double>(number), std::chars_format::general, 6);
+  } else if constexpr (std::is_signed_v<TNumber>) {
+    RequireDecimal(radix);
+    return ToChars(number);
+  } else {
+    return radix == 16 ? HexText(number, 2 * sizeof number) : ToChars(number, radix);
+  }
+}
 
 // The stored number, read without a virtual call.
 template <class TNumber, class TData>
@@ -95,14 +128,14 @@ std::string TCIMNumericValueImpl::ToString(unsigned char radix) const {
 
 bool TCIMNumericValueImpl::operator==(TCIMValue const& other) const {
   if (other.GetType() != fType) return false;
-  auto const& theirs = DataOf<TCIMNumericValueImpl>(other);
-  return OnNumber<bool>(fType, *this, [&](auto mine) { return mine == Stored<decltype(mine)>(theirs); });
+  return OnNumber<bool>(fType, *this,
+                        [&](auto mine) { return mine == Stored<decltype(mine)>(DataOf<TCIMNumericValueImpl>(other)); });
 }
 
 bool TCIMNumericValueImpl::operator<(TCIMValue const& other) const {
   if (other.GetType() != fType) return false;
-  auto const& theirs = DataOf<TCIMNumericValueImpl>(other);
-  return OnNumber<bool>(fType, *this, [&](auto mine) { return Stored<decltype(mine)>(theirs) > mine; });
+  return OnNumber<bool>(fType, *this,
+                        [&](auto mine) { return Stored<decltype(mine)>(DataOf<TCIMNumericValueImpl>(other)) > mine; });
 }
 
 }  // namespace NQRVZEP20

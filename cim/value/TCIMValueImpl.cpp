@@ -29,7 +29,7 @@ TCIMValueImpl::operator std::vector<TCIMValue>&() const { Refuse(); }
 
 TCIMValueImpl const& TCIMValueImpl::DataOf(TCIMValue const& value) {
   if (value.IsNull()) throw TZEPException(kZEPStatusValueIsNULL);
-  return *value.fImpl;
+  return *value.fData;
 }
 
 }  // namespace NQRVZEP20

@@ -4,6 +4,7 @@
 #include "ICIMClass.h"
 #include "TZEPException.h"
 
+#include <charconv>
 #include <map>
 
 namespace NQRVZEP20 {
@@ -19,7 +20,15 @@ std::string PlainText(TCIMValue const& value) {
   }
 }
 
+// Every digit: values that differ print the same in the six that ToString gives.
+std::string ExactText(double number) {
+  char text[32];
+  return std::string(text, std::to_chars(text, text + sizeof text, number).ptr);
+}
+
 std::string ValueText(TCIMValue const& value) {
+  if (value.GetType() == TCIMValue::TCIMType::kCIMTypeReal64) return ExactText(value);
+  if (value.GetType() == TCIMValue::TCIMType::kCIMTypeReal32) return ExactText(value.operator float());
   if (!value.IsReference()) return PlainText(value);
   const TCIMReference path = value;
   const boost::shared_ptr<ICIMClass> cls = path.GetClass();

@@ -15,10 +15,11 @@ boost::shared_ptr<ICIMNamespace> TMemoryClass::GetNamespace(TCIMContext const&) 
   return boost::shared_ptr<ICIMNamespace>(Namespace());
 }
 
-bool TMemoryClass::GetClassFlag(TCIMContext const& context) const {
+bool TMemoryClass::GetClassFlag(TCIMContext const&) const {
   if (IsMarked("Association")) return true;
-  const boost::shared_ptr<TMemoryClass> superClass = SuperClass();
-  return superClass && superClass->GetClassFlag(context);
+  for (boost::shared_ptr<TMemoryClass> cls = SuperClass(); cls; cls = cls->SuperClass())
+    if (cls->IsMarked("Association")) return true;
+  return false;
 }
 
 bool TMemoryClass::IsAbstract(TCIMContext const&) const { return IsMarked("Abstract"); }
@@ -124,9 +125,10 @@ boost::shared_ptr<TMemoryClass> TMemoryClass::SuperClass() const {
 }
 
 boost::shared_ptr<TMemoryPropertyDecl> TMemoryClass::FindPropertyDecl(std::string const& name) const {
-  if (const auto own = fPropertyDecls.Find(name)) return own;
-  const boost::shared_ptr<TMemoryClass> superClass = SuperClass();
-  return superClass ? superClass->FindPropertyDecl(name) : boost::shared_ptr<TMemoryPropertyDecl>();
+  boost::shared_ptr<TMemoryPropertyDecl> found = fPropertyDecls.Find(name);
+  for (boost::shared_ptr<TMemoryClass> cls = SuperClass(); cls && !found; cls = cls->SuperClass())
+    found = cls->fPropertyDecls.Find(name);
+  return found;
 }
 
 boost::shared_ptr<TMemoryInstance> TMemoryClass::FindInstance(TCIMReference const& path) const {

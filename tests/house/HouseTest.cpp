@@ -96,7 +96,7 @@ TEST(HouseTest, EveryPublicHeaderIsInTheOneThatIncludesThemAll) {
 
 // Every test of the tree, as "Suite.Name".
 std::set<std::string> AllTests() {
-  static std::regex const test(R"(^TEST(?:_F|_P)?\((\w+), (\w+)\))");
+  static std::regex const test(R"(^(?:TYPED_)?TEST(?:_F|_P)?\((\w+), (\w+)\))");
   std::set<std::string> tests;
   for (auto const& entry : fs::recursive_directory_iterator(kSource / "tests")) {
     if (entry.path().extension() != ".cpp") continue;

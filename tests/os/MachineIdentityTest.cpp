@@ -103,7 +103,7 @@ TEST(MachineIdentityTest, DamagedStructuresNameNoString) {
       {"no string set", "\1\6\0\0\0\1"s, "none"},
       {"a string that nothing ends", "\1\6\0\0\0\1one"s, "none"},
       {"a string and one zero", "\1\6\0\0\0\1one\0"s, "none"},
-      {"an empty set", "\1\6\0\0\0\1\0\0"s, ""},
+      {"an empty set", "\1\6\0\0\0\1\0\0"s, "none"},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);

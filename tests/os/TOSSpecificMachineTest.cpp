@@ -63,7 +63,7 @@ void ExpectIdentity(TIdentityRow const& row) {
 TEST_F(TOSSpecificMachineTest, ReadsRealTables) {
   TIdentityRow const rows[] = {
       {"full", "1234", "Server Q100 ", "AB7", "KQ12345", "AB"},    {"bare7", "1234", "Unknown", "Unknown", "KQ12345", "AB"},
-      {"eight", "0000", "Unknown", "Unknown", "KQ12345", "00"},  // the BIOS version has one character
+      {"eight", "0000", "Unknown", "Unknown", "KQ12345", "7"},  // the BIOS version has one character
       {"no-serial", "5678", "Server", "XY1", "Unknown", "AB"},     {"two-dashes", "erve", "Rack", "r Q", "KQ 99", "AB"},
       {"qemu-own", "0000", "Unknown", "Unknown", "Unknown", "AB"}, {"entry64", "1234", "Server Q100 ", "AB7", "KQ12345", "AB"},
   };
@@ -164,8 +164,8 @@ TEST_F(TOSSpecificMachineTest, TheBiosIDIsTheFirstTwoCharactersOrNone) {
       {"ab12", "ab"},
       {"-[12-3]-", "12"},
       {"XY", "XY"},
-      {"-[X-1.10]-", "00"},  // not there in full
-      {"X", "00"},
+      {"-[X-1.10]-", "X"},  // all there is
+      {"X", "X"},
       {"-1.10", "00"},
       {"[]", "00"},
   };

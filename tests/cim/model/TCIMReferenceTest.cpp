@@ -376,6 +376,23 @@ TEST_F(TCIMReferenceTest, ANestedPathMayEndTheTextWithoutItsClosingQuote) {
   EXPECT_EQ(KeysOf(Parsed("ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\"")), TNames({"Disk=X_Disk.Id=\"5\""}));
 }
 
+TEST_F(TCIMReferenceTest, ReferencesAreNestedAtMost100Deep) {
+  auto const nested = [](int depth) {
+    std::string path;
+    for (int i = 0; i < depth; ++i) path += "ns:X_Link.Disk=\"";
+    return path + "ns:X_Link.Port=\"1\"" + std::string(static_cast<std::size_t>(depth), '"');
+  };
+  TCIMReference deepest = Empty();
+  deepest.SetPath(nested(100));
+  for (int depth : {101, 100000}) {
+    SCOPED_TRACE(depth);
+    TLogCapture log;
+    TCIMReference tooDeep = Empty();
+    EXPECT_STATUS(tooDeep.SetPath(nested(depth)), kZEPStatusInvalidReference);
+    EXPECT_EQ(log.Entries(), std::vector<std::string>{"[Error] Reference nested too deeply, path=" + nested(depth)});
+  }
+}
+
 TEST_F(TCIMReferenceTest, FailuresInANestedPathNameTheWholePathOnce) {
   struct {
     char const* path;

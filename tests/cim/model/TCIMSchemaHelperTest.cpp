@@ -570,6 +570,14 @@ TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberMayBeANumber) {
   EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "20000000000");
 }
 
+TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberOfAnotherTypeIsPassedOver) {
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue("12345"));
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", Strings({"23456"}));
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue(TCIMChar16(std::string("x"))));
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue(TCIMDateTime()));
+  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "12345");
+}
+
 TEST_F(TCIMSchemaHelperEsxiTest, WithoutChassisTheSerialNumberIsNotFound) {
   EXPECT_STATUS(SerialNumber(), kZEPStatusNotFound);
   Add("OMC_UnitaryComputerSystem", "OtherIdentifyingInfo", Strings({"SN:KQ1234A"}));

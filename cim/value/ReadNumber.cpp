@@ -1,6 +1,4 @@
-#include "cim/value/NumberText.h"
-
-#include "TZEPException.h"
+#include "cim/value/ReadNumber.h"
 
 #include <charconv>
 #include <limits>
@@ -10,26 +8,6 @@
 
 namespace NQRVZEP20 {
 namespace {
-
-constexpr std::size_t kLongestText = 24;  // a uint64 in base 8 has 22 digits
-
-// What std::to_chars writes into a buffer, as a string.
-template <class... TArguments>
-std::string ToChars(TArguments... arguments) {
-  char buffer[kLongestText];
-  char* const end = std::to_chars(buffer, buffer + sizeof buffer, arguments...).ptr;
-  return std::string(buffer, end);
-}
-
-std::string HexText(unsigned long number, std::size_t width) {
-  std::string text(width, '0');
-  for (auto digit = text.rbegin(); digit != text.rend(); ++digit, number >>= 4) *digit = "0123456789ABCDEF"[number & 0xF];
-  return text;
-}
-
-void RequireDecimal(unsigned char radix) {
-  if (radix != 10) throw TZEPException(kZEPStatusNotSupported);
-}
 
 bool IsBlank(char c) { return c == ' ' || (c >= '\t' && c <= '\r'); }
 bool IsDigit(char c) { return c >= '0' && c <= '9'; }
@@ -109,21 +87,6 @@ bool ReadBoolean(std::string_view text) { return WithoutLeadingBlanks(text).subs
 }  // namespace
 
 template <class TNumber>
-std::string TextOf(TNumber number, unsigned char radix) {
-  if constexpr (std::is_same_v<TNumber, bool>) {
-    return number ? "true" : "false";
-  } else if constexpr (std::is_floating_point_v<TNumber>) {
-    RequireDecimal(radix);
-    return ToChars(static_cast<double>(number), std::chars_format::general, 6);
-  } else if constexpr (std::is_signed_v<TNumber>) {
-    RequireDecimal(radix);
-    return ToChars(number);
-  } else {
-    return radix == 16 ? HexText(number, 2 * sizeof number) : ToChars(number, radix);
-  }
-}
-
-template <class TNumber>
 TNumber ReadNumber(std::string_view text) {
   if constexpr (std::is_same_v<TNumber, bool>)
     return ReadBoolean(text);
@@ -133,22 +96,14 @@ TNumber ReadNumber(std::string_view text) {
     return ReadInteger<TNumber>(text);
 }
 
-#define ZEP_NUMBER_TEXT(TNumber)                       \
-  template std::string TextOf(TNumber, unsigned char); \
-  template TNumber ReadNumber<TNumber>(std::string_view);
-
-ZEP_NUMBER_TEXT(bool)
-ZEP_NUMBER_TEXT(unsigned char)
-ZEP_NUMBER_TEXT(signed char)
-ZEP_NUMBER_TEXT(unsigned short)
-ZEP_NUMBER_TEXT(short)
-ZEP_NUMBER_TEXT(unsigned int)
-ZEP_NUMBER_TEXT(int)
-ZEP_NUMBER_TEXT(unsigned long)
-ZEP_NUMBER_TEXT(long)
-ZEP_NUMBER_TEXT(float)
-ZEP_NUMBER_TEXT(double)
-
-#undef ZEP_NUMBER_TEXT
+template bool ReadNumber(std::string_view);
+template unsigned short ReadNumber(std::string_view);
+template short ReadNumber(std::string_view);
+template unsigned int ReadNumber(std::string_view);
+template int ReadNumber(std::string_view);
+template unsigned long ReadNumber(std::string_view);
+template long ReadNumber(std::string_view);
+template float ReadNumber(std::string_view);
+template double ReadNumber(std::string_view);
 
 }  // namespace NQRVZEP20
