@@ -1,8 +1,8 @@
 #include "TCIMNumericValueImpl.h"
 
+#include "cim/value/NumberText.h"
 #include "cim/value/ScalarTypes.h"
 
-#include <charconv>
 #include <type_traits>
 
 namespace NQRVZEP20 {
@@ -10,20 +10,6 @@ namespace NQRVZEP20 {
 using TType = TCIMValue::TCIMType;
 
 namespace {
-
-// What std::to_chars writes into a buffer, as a string.
-template <class... TArguments>
-std::string ToChars(TArguments... arguments) {
-  char buffer[24];  // a uint64 in base 8 has 22 digits
-  char* const end = std::to_chars(buffer, buffer + sizeof buffer, arguments...).ptr;
-  return std::string(buffer, end);
-}
-
-std::string HexText(unsigned long number, std::size_t width) {
-  std::string text(width, '0');
-  for (auto digit = text.rbegin(); digit != text.rend(); ++digit, number >>= 4) *digit = "0123456789ABCDEF"[number & 0xF];
-  return text;
-}
 
 void RequireDecimal(unsigned char radix) {
   if (radix != 10) throw TZEPException(kZEPStatusNotSupported);
@@ -35,12 +21,15 @@ std::string TextOf(TNumber number, unsigned char radix) {
     return number ? "true" : "false";
   } else if constexpr (std::is_floating_point_v<TNumber>) {
     RequireDecimal(radix);
-    return ToChars(static_cast<double>(number), std::chars_format::general, 6);
+    return RealText(number);
   } else if constexpr (std::is_signed_v<TNumber>) {
     RequireDecimal(radix);
-    return ToChars(number);
+    return DecimalText(static_cast<long>(number));
   } else {
-    return radix == 16 ? HexText(number, 2 * sizeof number) : ToChars(number, radix);
+    auto const unsignedNumber = static_cast<unsigned long>(number);
+    return radix == 10   ? DecimalText(unsignedNumber)
+           : radix == 16 ? HexText(unsignedNumber, 2 * sizeof number)
+                         : OctalText(unsignedNumber);
   }
 }
 

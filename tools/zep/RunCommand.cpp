@@ -26,13 +26,11 @@ std::string WhyItFailed(std::string const& program, int timeout) {
 }
 
 int RunCommandLine(std::vector<std::string> commandLine, int timeout) {
-  bool const isMarked = !commandLine.empty() && commandLine.front() == "--";  // what follows is a command in any case
-  if (isMarked) commandLine.erase(commandLine.begin());
   if (commandLine.empty()) {
     std::cerr << "zep: there is no command to run\n";
     return kExitUsage;
   }
-  if (!isMarked && commandLine.front().rfind('-', 0) == 0) {
+  if (commandLine.front().rfind('-', 0) == 0) {
     std::cerr << "zep: there is no option " << Printable(commandLine.front()) << "\n";
     return kExitUsage;
   }

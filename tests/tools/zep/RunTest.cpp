@@ -67,13 +67,6 @@ TEST_F(RunTest, WithoutACommandOrWithAnOddTimeoutItIsWrongUsage) {
   TRun const unknown = Run({"--unknown", "true"});
   EXPECT_EQ(unknown.status, 64);
   EXPECT_EQ(unknown.errors, "zep: there is no option --unknown\n");
-  EXPECT_EQ(Run({"--"}).status, 64);
-}
-
-TEST_F(RunTest, TwoDashesMayStandBeforeTheCommand) {
-  TRun const run = Run({"--timeout", "60", "--", "echo", "--", "-n"});
-  EXPECT_EQ(run.status, 0);
-  EXPECT_EQ(run.output, "-- -n\n");
 }
 
 }  // namespace
