@@ -12,6 +12,18 @@ std::atomic<long> gAllocations = 0;
 
 }  // namespace
 
+#if defined(__has_feature)
+#if __has_feature(thread_sanitizer)
+#define ZEP_THREAD_SANITIZER
+#endif
+#endif
+
+#ifdef ZEP_THREAD_SANITIZER
+
+bool NQRVZEP20::CountsAllocations() { return false; }
+
+#else
+
 // Found by the libraries before those of the C++ library.
 
 ZEP_EXPORT void* operator new(std::size_t size) {
@@ -23,5 +35,9 @@ ZEP_EXPORT void* operator new(std::size_t size) {
 ZEP_EXPORT void operator delete(void* memory) noexcept { std::free(memory); }
 
 ZEP_EXPORT void operator delete(void* memory, std::size_t) noexcept { std::free(memory); }
+
+bool NQRVZEP20::CountsAllocations() { return true; }
+
+#endif
 
 long NQRVZEP20::CountedAllocations() { return gAllocations; }
