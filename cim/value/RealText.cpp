@@ -12,8 +12,8 @@
 namespace NQRVZEP20 {
 namespace {
 
-// The range in which SixDigitsOf needs no more than 128 bits.
-constexpr double kLeastExact = 1e-22;
+// The range in which SixDigitsOf needs no power of five above the table's, and no more than 128 bits.
+constexpr double kLeastExact = 1e-21;
 constexpr double kBeyondExact = 1e22;
 
 __extension__ typedef unsigned __int128 TUint128;
