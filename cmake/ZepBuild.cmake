@@ -37,6 +37,11 @@ if(ZEP_SANITIZE)
   add_link_options(-fsanitize=${ZEP_SANITIZE})
 endif()
 
+if(ZEP_BUILD_FUZZ)
+  # So that the fuzzer sees which branches of the library an input takes, not only those of the target itself.
+  target_compile_options(zep_options INTERFACE -fsanitize=fuzzer-no-link)
+endif()
+
 # A room of libzepcore.so. It sees the public headers and, as "room/Header.h", the private ones; which rooms it may
 # name there is checked by tests/house.
 function(zep_room name)
@@ -61,10 +66,7 @@ function(zep_test name)
     set(ARG_TIMEOUT 60)
   endif()
   add_executable(${name} ${ARG_SOURCES})
-  target_link_libraries(${name} PRIVATE zep_options zepcore ${ARG_LIBS} GTest::gmock GTest::gtest_main Threads::Threads)
-  target_include_directories(${name} PRIVATE ${PROJECT_SOURCE_DIR})
-  target_compile_definitions(${name} PRIVATE ZEP_SOURCE_DIR="${PROJECT_SOURCE_DIR}" ZEP_BUILD_DIR="${PROJECT_BINARY_DIR}"
-                                             ZEP_TEST_DATA_DIR="${PROJECT_SOURCE_DIR}/tests/data")
+  target_link_libraries(${name} PRIVATE test_support ${ARG_LIBS} GTest::gtest_main)
   set_target_properties(${name} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${ZEP_TEST_DIR})
   set(properties TIMEOUT ${ARG_TIMEOUT})
   if(ARG_LABELS)

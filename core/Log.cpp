@@ -6,7 +6,9 @@ namespace NQRVZEP20 {
 
 bool IsLogged(ILogger::EZEPLogSeverity severity) {
   ILogger* const logger = TRootObject::GetCoreLogger();
-  return logger != nullptr && severity <= logger->GetLogThreshold();
+  if (logger == nullptr) return false;
+  bool const isNeverFiltered = severity == ILogger::kLogMemoryOnly || severity == ILogger::kLogMemoryOnlyAlways;
+  return isNeverFiltered || severity <= logger->GetLogThreshold();
 }
 
 void WriteLogEntry(ILogger::EZEPLogSeverity severity, std::string const& message) {

@@ -13,7 +13,8 @@ namespace NQRVZEP20 {
 //
 //   LogDebug("TConfig::getValue(): key ", key, " found, value is ", value);
 
-// Whether an entry of that severity would get past the threshold of the calling thread's logger.
+// Whether an entry of that severity would get past the threshold of the calling thread's logger; the memory-only ones always
+// do.
 bool IsLogged(ILogger::EZEPLogSeverity severity);
 
 void WriteLogEntry(ILogger::EZEPLogSeverity severity, std::string const& message);

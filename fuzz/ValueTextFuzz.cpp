@@ -28,7 +28,8 @@ TNumber Extracted(std::string const& text) {
   std::istringstream stream(text);
   stream.imbue(std::locale::classic());
   TNumber number{};
-  return stream >> std::boolalpha >> number ? number : TNumber{};
+  stream >> std::boolalpha >> number;
+  return stream ? number : TNumber{};
 }
 
 template <class TStored, class TRead = TStored>

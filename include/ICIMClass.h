@@ -41,7 +41,7 @@ public:
 
   // Declares a property. The default value, NULL for none, gives its type, array bound and referenced class. Throws
   // kZEPStatusAlreadyExists when this class itself declares the name, kZEPStatusTypeMismatch for a default of tag 0, and
-  // kZEPStatusInvalidOpSequence once the class or a subclass has instances.
+  // kZEPStatusInvalidOpSequence once CreateInstance of the class or of a subclass was called.
   virtual boost::shared_ptr<ICIMPropertyDecl> AddPropertyDecl(std::string const& name, TCIMValue const& defaultValue,
                                                               TCIMContext const& context) = 0;
 
@@ -56,7 +56,7 @@ public:
 
   // ---- Static properties: values that belong to the class ----
 
-  // Gives a declared property of this class a value in the class itself, replacing an earlier one. Throws
+  // Gives a property that this class declares or inherits a value in the class itself, replacing an earlier one. Throws
   // kZEPStatusNotFound for a name that is not declared and kZEPStatusTypeMismatch for a value of another type.
   virtual void SetStaticProperty(std::string const& name, TCIMValue const& value, TCIMContext const& context) = 0;
 
@@ -88,7 +88,8 @@ public:
 
   // Adds an instance that CreateInstance of this class has made to the class's instances. Throws
   // kZEPStatusInvalidInstance for any other instance, and kZEPStatusAlreadyExists when it is already there or another
-  // instance of the class has the same keys. From then on its keys are not to be changed.
+  // instance of the class has the same keys (any number may have none, or only NULL ones). From then on its keys cannot be
+  // changed.
   virtual void CommitInstance(boost::shared_ptr<ICIMInstance> instance, TCIMContext const& context) = 0;
 };
 

@@ -24,7 +24,8 @@ namespace NQRVZEP20 {
 //   collects everything. The callback may look elements up, but must not add to what is being enumerated.
 // - Failure is a thrown TZEPException. A class, property declaration or qualifier declaration that is not there is
 //   kZEPStatusNotFound; anything else that is not there comes back as an empty pointer.
-// - Names are compared without regard to case, as CIM names are, and keep the spelling they were made with.
+// - Names are compared without regard to case, as CIM names are, and keep the spelling they were made with. What is
+//   created or declared under a name that is no CIM name throws kZEPStatusInvalidCIMName.
 // - Nothing is promised about threads: one namespace is used from one thread at a time.
 class ZEP_EXPORT ICIMElement {
 public:

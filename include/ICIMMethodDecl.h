@@ -14,7 +14,8 @@ public:
   virtual TCIMValue::TCIMType GetReturnType(TCIMContext const& context) const = 0;  // never an array
 
   // Adds a parameter behind the others. `referencedClassName` is empty unless the type is a reference or an array of
-  // references. Throws kZEPStatusAlreadyExists when the method has a parameter of that name.
+  // references (kZEPStatusNotReference), `maxArraySize` is 0 unless it is an array (kZEPStatusNotArray). Throws
+  // kZEPStatusAlreadyExists when the method has a parameter of that name, kZEPStatusTypeMismatch for a type without name.
   virtual boost::shared_ptr<ICIMParameterDecl> AddParameterDecl(std::string const& name, TCIMValue::TCIMType type,
                                                                 unsigned int maxArraySize,
                                                                 std::string const& referencedClassName,

@@ -7,7 +7,8 @@ namespace NQRVZEP20 {
 
 class ICIMQualifier;
 
-// A schema element that has a name and may carry qualifiers: a class, property, method or parameter declaration.
+// A schema element that has a name and may carry qualifiers: a class, property, method or parameter declaration. Where
+// these interfaces ask whether an element carries a qualifier, one with the boolean value false counts for nothing.
 class ZEP_EXPORT ICIMNamedElement : public ICIMElement {
 public:
   ~ICIMNamedElement() override;
@@ -21,8 +22,10 @@ public:
   virtual void EnumerateQualifiers(boost::function<bool(boost::shared_ptr<ICIMQualifier>)> callback,
                                    TCIMContext const& context) const = 0;
 
-  // Writes a qualifier on this element. `declaration` comes from this element's own namespace; the value must be of the
-  // declared type (kZEPStatusTypeMismatch). Throws kZEPStatusAlreadyExists when the element has this qualifier.
+  // Writes a qualifier on this element. `declaration` is one of this element's own namespace (kZEPStatusNotFound); the
+  // value must be of the declared type (kZEPStatusTypeMismatch). Throws kZEPStatusAlreadyExists when the element has this
+  // qualifier, and kZEPStatusInvalidOpSequence for Key on a property of a class that has made instances. Whether the
+  // qualifier may stand on this kind of element is not checked.
   virtual boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                         unsigned int flavor, TCIMContext const& context) = 0;
 };

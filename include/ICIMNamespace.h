@@ -17,7 +17,7 @@ public:
   virtual std::string GetName(TCIMContext const& context) const = 0;  // such as "root/cimv2"
 
   // Creates a class under `superClass`, which is of this namespace (kZEPStatusInvalidClass) or empty for a root class.
-  // Throws kZEPStatusAlreadyExists when there is a class of that name and kZEPStatusInvalidCIMName when it is no CIM name.
+  // Throws kZEPStatusAlreadyExists when there is a class of that name.
   virtual boost::shared_ptr<ICIMClass> CreateClass(boost::shared_ptr<ICIMClass> superClass, std::string const& name,
                                                    TCIMContext const& context) = 0;
 
@@ -32,7 +32,7 @@ public:
   // ---- Qualifier declarations ----
 
   // The default value, NULL for none, gives type and array bound. `scope` and `flavor` are sets of
-  // ICIMQualifierDecl::EScope and EFlavor. Throws kZEPStatusAlreadyExists, kZEPStatusInvalidCIMName, and
+  // ICIMQualifierDecl::EScope and EFlavor. Throws kZEPStatusAlreadyExists when the name is declared, and
   // kZEPStatusTypeMismatch for a type that no qualifier can have (tag 0, references).
   virtual boost::shared_ptr<ICIMQualifierDecl> CreateQualifierDecl(std::string const& name, TCIMValue const& defaultValue,
                                                                    unsigned int scope, unsigned int flavor,
@@ -46,7 +46,8 @@ public:
 
   // ---- Instances ----
 
-  // The committed instance that the path names; empty when there is none.
+  // The committed instance that the path names: of that very class (an instance of a subclass goes by its own class) and
+  // with exactly these keys. Empty when there is none.
   virtual boost::shared_ptr<ICIMInstance> GetInstance(TCIMReference const& path, TCIMContext const& context) const = 0;
 };
 

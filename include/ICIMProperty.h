@@ -13,7 +13,8 @@ public:
 
   virtual TCIMValue GetValue(TCIMContext const& context) const = 0;
 
-  // Throws kZEPStatusTypeMismatch when the value's type, NULL or not, is not the declared one.
+  // Throws kZEPStatusTypeMismatch when the value's type, NULL or not, is not the declared one, and
+  // kZEPStatusInvalidOpSequence for a key of an instance that was committed.
   virtual void SetValue(TCIMValue const& value, TCIMContext const& context) = 0;
 
   virtual std::string GetName(TCIMContext const& context) const = 0;  // spelled as declared

@@ -19,7 +19,8 @@ class ZEP_EXPORT TCIMDateTime {
 public:
   TCIMDateTime();
   TCIMDateTime(std::string const& text);
-  TCIMDateTime(unsigned int days, unsigned short hours, unsigned short minutes, unsigned short seconds, unsigned int microSeconds);
+  TCIMDateTime(unsigned int days, unsigned short hours, unsigned short minutes, unsigned short seconds,
+               unsigned int microSeconds);
   TCIMDateTime(unsigned short year, unsigned short month, unsigned int day, unsigned short hour, unsigned short minute,
                unsigned short second, unsigned int microSeconds, short utcOffset);
   TCIMDateTime(TCIMDateTime const& other);

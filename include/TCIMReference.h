@@ -3,6 +3,7 @@
 #include "TCIMValue.h"
 #include "ZEPExport.h"
 
+#include <boost/assert.hpp>
 #include <boost/function.hpp>
 #include <boost/shared_ptr.hpp>
 
@@ -46,8 +47,8 @@ public:
 
   // Reads a path into a reference that has a live namespace, no class and no keys. Keys are read only behind a namespace
   // prefix (`ns:X_Disk.Id="5"`), which is dropped; without one the whole text is a class name. Malformed paths, unknown
-  // classes and unknown keys are logged as errors and throw kZEPStatusInvalidReference; what was read before stays set. A
-  // key that comes twice keeps its first value.
+  // classes and keys, and references nested more than 100 deep are logged as errors and throw kZEPStatusInvalidReference;
+  // what was read before stays set. A key that comes twice keeps its first value.
   void SetPath(std::string const& path);
 
   // ---- Parts ----
@@ -93,7 +94,10 @@ public:
   TCIMReferenceImpl* GetBody() const { return fBody.get(); }  // owned by this reference
 
 private:
-  TCIMReferenceImpl& Body() const;
+  TCIMReferenceImpl& Body() const {
+    BOOST_ASSERT(fBody != nullptr);
+    return *fBody;
+  }
   void BindBody() noexcept;  // tells the body whose it is now
 
   std::unique_ptr<TCIMReferenceImpl> fBody;  // null only in a reference that was moved from

@@ -52,11 +52,13 @@ public:
   bool operator<(TCIMReferenceImpl const& other) const;
 
 private:
-  void ReadClass(std::string const& path, std::size_t begin, std::size_t end);
-  std::size_t ReadKeyBinding(std::string const& path, std::size_t pos);
+  void LookUpClass(ICIMNamespace const& ns, std::string const& name);
+
+  // The steps of ParsePath.
+  void ReadClass(ICIMNamespace const& ns, std::string const& path, std::size_t begin, std::size_t end);
+  std::size_t ReadKeyBinding(boost::shared_ptr<ICIMNamespace> const& ns, std::string const& path, std::size_t pos);
   boost::shared_ptr<ICIMPropertyDecl const> ReadDeclaration(std::string const& path, std::string const& name) const;
-  TCIMValue ReadReference(std::string const& path, std::size_t& pos) const;
-  TCIMValue ReadValue(ICIMPropertyDecl const& declaration, std::string const& path, std::size_t& pos) const;
+  TCIMValue ReadReference(boost::shared_ptr<ICIMNamespace> const& ns, std::string const& path, std::size_t& pos) const;
 
   std::reference_wrapper<TCIMReference> fOwner;  // handed to the namespace when the instance is looked up
   boost::weak_ptr<ICIMNamespace> fNamespace;
@@ -65,6 +67,7 @@ private:
   std::map<std::string, TCIMValue> fKeys;   // by name, in byte order
   boost::shared_ptr<ICIMElement> fElement;  // the instance, once found; never looked up again
   std::string fNamespaceName;               // the caller's label; has nothing to do with fNamespace
+  int fDepth = 0;                           // how many paths that are being read this one stands in
 };
 
 }  // namespace NQRVZEP20

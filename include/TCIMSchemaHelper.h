@@ -16,7 +16,10 @@ class ICIMNamespace;
 //
 // Unless said otherwise a query reads one property of the only instance of its class and throws kZEPStatusNotFound when
 // the class, the property or that one instance is missing; a value that is NULL or no string throws what the conversion
-// of TCIMValue throws.
+// of TCIMValue throws. Other failures of the namespace pass through.
+//
+// The namespace is asked with a context that names the provider (kContextName is kPluginNSPName). Where a query takes a
+// context, its entries go along, and an entry kContextName of the caller's own is kept.
 class ZEP_EXPORT TCIMSchemaHelper {
 public:
   static std::string const kSystemCreationClassName;           // "QRVSG_ComputerSystem"
@@ -44,8 +47,8 @@ public:
   // logged at debug severity.
   static std::string GetRawMTMString(boost::shared_ptr<ICIMNamespace> ns);
 
-  // Found in the product name: "Server X1-[1234ABC]-", "Server X1-[1234]-", "1234ABC" or "1234". Throws
-  // kZEPStatusInvalidFormat for any other form.
+  // Found in the product name: "Server X1-[1234ABC]-", "Server X1-[1234]-", "1234ABC" or "1234". A few older models, known
+  // by name, carry it without brackets. Throws kZEPStatusInvalidFormat for any other form.
   static std::string GetMTM(boost::shared_ptr<ICIMNamespace> ns);
   static std::string GetMachineType(boost::shared_ptr<ICIMNamespace> ns);  // its first 4 characters
   static std::string GetModelNumber(boost::shared_ptr<ICIMNamespace> ns);  // its last 3
@@ -66,7 +69,8 @@ public:
   // ---- Parts of the data source's version, such as 3.20.5. Throw kZEPStatusNotFound when the dots are missing. ----
 
   static std::string GetDataSourceMajorVersion(boost::shared_ptr<ICIMNamespace> ns, TCIMContext context);  // before the first "."
-  static std::string GetDataSourceMinorVersion(boost::shared_ptr<ICIMNamespace> ns, TCIMContext context);  // between the first two
+  static std::string GetDataSourceMinorVersion(boost::shared_ptr<ICIMNamespace> ns,
+                                               TCIMContext context);                  // between the first two
   static std::string GetDataSourceBuildVersion(boost::shared_ptr<ICIMNamespace> ns);  // behind the last
 
   // ---- VMware ESXi hosts, which describe themselves in other classes. These look at every instance and answer "Unknown"
@@ -76,7 +80,7 @@ public:
   static std::string GetSystemProductName_vmwesxi(boost::shared_ptr<ICIMNamespace> ns);
   static std::string GetMTM_vmwesxi(boost::shared_ptr<ICIMNamespace> ns);  // what stands between its "-[" and "]-"
 
-  // The last "LargeBuildNumber" of the VMware_HypervisorSoftwareIdentity instances.
+  // The last "LargeBuildNumber" of the VMware_HypervisorSoftwareIdentity instances, a text or a number.
   static std::string GetOperatingSystemName_vmwesxi(boost::shared_ptr<ICIMNamespace> ns);
 
   // The last "SerialNumber" of the OMC_Chassis instances; throws kZEPStatusNotFound when there is no instance. For the

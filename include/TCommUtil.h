@@ -21,6 +21,11 @@ public:
   // Creates every missing directory along the path. Throws what TOSSpecific::CreateDir throws, and leaves the directories
   // made until then; a plain file in the way is kZEPStatusDirectoryAlreadyExists.
   static void MkDirHier(std::string const& path);
+
+  // The first line of a text without the blanks around it, and without what follows its first carriage return (a blank
+  // before that one stays). Tabs are no blanks. Empty when what is left holds anything but ASCII letters, digits,
+  // punctuation and white space.
+  static std::string RemoveSpaces(std::string text);
 };
 
 }  // namespace NQRVZEP20

@@ -17,8 +17,9 @@ namespace NQRVZEP20 {
 // not, and are meant to be set during start-up. Every operation blocks for the file system.
 class ZEP_EXPORT TLogger : public ILogger {
 public:
-  // The calling thread's logger, made on its first call. Never null; owned by the thread. A thread that calls this after its
-  // logger was destroyed (from the destructor of a thread-local or static object) gets a new one, which has no file.
+  // The calling thread's logger, made on its first call. Never null; owned by the thread. What still calls this after the
+  // thread's logger was destroyed (from the destructor of a static object, say) gets a new one, which has no file. Throws
+  // boost::thread_resource_error when the system has no place for it.
   static TLogger* GetInstance();
 
   // ---- Shared by all threads ----

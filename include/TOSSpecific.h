@@ -4,15 +4,22 @@
 #include "TCIMDateTime.h"
 #include "ZEPExport.h"
 
+#include <fstream>
 #include <string>
 #include <vector>
 
 namespace NQRVZEP20 {
 
 class INamespaceConsumer;
+class TPluginManagerProvider;  // the host's handle for the machine-identification library; only ever handed on
 
 // ".nsp.so", the ending of every namespace provider library.
 ZEP_EXPORT extern std::string const kNSPExtension;
+
+// Two flags of the process, false at the start, for the front ends to set and read (setLuz, setZEPParser); the library
+// itself asks for neither. Set them once, at start-up.
+ZEP_EXPORT extern bool isLuz;
+ZEP_EXPORT extern bool isParser;  // whether the process runs as the collector's parser
 
 // Every service of the operating system that the library uses. Static operations only. Each runs on the caller's thread
 // and blocks it until done; none takes a lock. Failures are thrown as TZEPException unless an operation says otherwise.
@@ -28,6 +35,53 @@ public:
   // kZEPStatusDirectoryAlreadyExists when something is there (EEXIST), kZEPStatusAccessDenied for EACCES and EROFS, else
   // kZEPStatusFileSystemError.
   static int CreateDir(std::string path);
+
+  // The size in bytes. Throws kZEPStatusFileNotFound when it is not a file that can be asked.
+  static long GetFileSize(std::string path);
+
+  // Copies the contents of a file. A destination that is not there is made with the source's permission bits less the
+  // umask; one that is there keeps its own bits and is not truncated: behind a shorter source its old tail stays. Throws
+  // kZEPStatusFileSystemError for any failure, and leaves what was copied until then.
+  static void FileCopy(std::string from, std::string to);
+
+  // Copies the files of a directory, following links, with their directories when `recursive` is set. `to` is made when
+  // it is not there, its parents are not. An entry that is gone or a link to nothing is passed over. Returns what closing
+  // the source directory returned, 0. Throws kZEPStatusFileSystemError when a directory cannot be opened, and what
+  // CreateDir and FileCopy throw; what was copied until then stays.
+  static int DirCopy(std::string from, std::string to, bool recursive);
+
+  // The names, not paths, of all entries but "." and "..", in the order of the system. Throws kZEPStatusFileSystemError
+  // when the directory cannot be opened.
+  static std::vector<std::string> ListDir(std::string path);
+
+  // The lines that the command "find" prints for `name`, its complaints among them. As SpawnProcess, with 300 seconds of
+  // silence allowed.
+  static std::vector<std::string> FindFile(std::string name);
+
+  // Runs "rm -f <path>" through the shell, without quotes: the path may hold shell patterns. Always true.
+  static bool deleteFile(std::string path);
+
+  // Makes or truncates a file (bits 0644 less the umask) and writes `contents` into it in one write, whose result nobody
+  // asks for. False, with the reason in the log at debug severity, when it cannot be opened. Does not throw.
+  static bool createFile(std::string path, std::string contents);
+
+  // Opens the stream on `path`, made or truncated; a stream that is open is closed first. A failure is logged as an error
+  // and throws kZEPStatusAccessDenied for EACCES, else kZEPStatusFileSystemError.
+  static void OpenOutputFileStream(std::ofstream& stream, std::string path);
+
+  // The working directory. Throws kZEPStatusFail when there is none or its path is longer than 1023 bytes.
+  static std::string GetCurrentDir();
+
+  // An environment variable; empty, with a line in the log, when it is not set. Does not throw.
+  static std::string GetEnvironment(std::string name);
+
+  // Sets an environment variable, in place of an earlier value. False, with a line in the log, when the name will not do.
+  // Does not throw. Not to be called while another thread reads the environment.
+  static bool PutEnvironment(std::string name, std::string value);
+
+  // `path` below `base`, or `path` itself when it is absolute or `base` is empty; in each case without its own trailing
+  // separator, of which one is taken off. The path "/" is empty then, and so counts as relative.
+  static std::string RelocateRelativePath(std::string base, std::string path);
 
   // True when "docs/oem_zep_preboot_readme.txt" exists below the working directory: the OEM variant of the collector.
   static bool isOEMBuild();
@@ -48,8 +102,91 @@ public:
   // ---- Console, time and host probes (TOSSpecificConsole.cpp) ----
 
   // Now, as local time to the millisecond. The UTC offset is that of the zone's standard time, plus 60 while daylight
-  // saving is in force (60 also where the zone shifts by another amount). TZ is looked at on each call.
+  // saving is in force: 60 also where the zone shifts by half an hour or, as Ireland does in winter, backwards. TZ is
+  // looked at on each call.
   static TCIMDateTime GetLocalTime();
+
+  // Whether a key waits on standard input; also true when asking fails. Never blocks. The local modes of the terminal
+  // (echo, waiting for Enter, signals from keys) are off while it asks. Not from two threads at once.
+  static bool IsKeyWaiting();
+
+  // Waits for one character on standard input, not echoed and without Enter, and returns it, or EOF. It is read past
+  // stdio: what std::cin or stdin has buffered is not seen. Not from two threads at once.
+  static int GetKeyboardChar();
+
+  // Sleeps that many milliseconds, whatever the name says. Returns 0, or -1 when a signal ended the sleep early.
+  static int USleep(unsigned int milliseconds);
+
+  // Whether the real user is root.
+  static bool IsAdmin();
+
+  // 0 on the control domain of a Xen host, 1 on a guest domain, 2 where /proc/xen/capabilities does not exist. Throws as
+  // CaptureFile when it exists but cannot be read.
+  static int GetRunningTypeOnXen();
+
+  // Runs "sh" and waits for its end. Returns what system() returned.
+  static int LaunchCommandShell();
+
+  // Hands both arguments on unchanged; nothing is expanded on this platform.
+  static void ExpandCommandLineWildcards(int argc, char** argv, int* newArgc, char*** newArgv);
+
+  static void setLuz(bool value);
+  static bool getLuz();
+  static void setZEPParser(bool value);
+  static bool isZEPParser();
+
+  // ---- Processes and captured output (TOSSpecificProcess.cpp) ----
+  //
+  // A child gets its standard output and standard error joined into one pipe, which the caller's thread reads until the
+  // last process that holds it closes it. It inherits everything else: standard input, every open descriptor that is not
+  // marked close-on-exec, working directory, signal mask and ignored signals. Its start costs the same however much
+  // memory the caller holds; fork handlers are not run.
+  //
+  // `timeout` is the longest silence allowed between two chunks of output, in seconds, not a limit on the run; -1 waits
+  // for ever. A child that is silent for longer is left alone: neither ended nor waited for.
+  //
+  // Output is appended as it comes. A zero byte cuts off the rest of the chunk (at most 4095 bytes) in which it came.
+  //
+  // The result is 0 when the child ran to its end and exited with 0, and -1 in every other case: its own exit code is not
+  // passed on, also not that of a program that could not be executed (255). Nothing is retried when a signal interrupts
+  // it; a read end that select cannot watch (descriptor 1024 and above) counts as a failure of select, and nothing is run
+  // then. When no process could be made, an error is logged and kZEPStatusFail thrown.
+
+  // Runs `path` with exactly that environment ("NAME=value"), `argv0` as its name and then `args`.
+  static int SpawnProcess(std::string const& path, std::vector<std::string> const& args, std::string const& argv0,
+                          std::vector<std::string> const& env, std::string& output, int timeout);
+
+  // Runs `program`, searched on PATH, in the caller's environment.
+  static int SpawnProcess(std::string program, std::vector<std::string> args, std::string& output, int timeout);
+
+  // The same; returns the output, whatever became of the child.
+  static std::string SpawnProcess(std::string program, std::vector<std::string> args, int timeout);
+
+  // The same with a command line that is cut at every single blank: two in a row make an empty argument, one at the end
+  // as well. Quotes mean nothing.
+  static std::string SpawnProcess(std::string commandLine, int timeout);
+
+  // Runs a program that leaves a file behind (300 seconds of silence allowed, its output thrown away) and reads that file
+  // into `contents`. Does not throw: a failure is logged as an error and leaves `contents` empty.
+  static void CapFileViaProc(std::string program, std::vector<std::string> args, std::string fileName, std::string& contents);
+
+  // The whole file. One that cannot be opened is logged as an error and throws kZEPStatusFileNotFound; for a failing read
+  // see GetFileContents.
+  static std::string CaptureFile(std::string path);
+
+  // The whole file; empty, with two lines in the log at debug severity, when it cannot be opened. `logContents`, and a
+  // failing read: see GetFileContents.
+  static std::string CaptureFileLoader(std::string path, bool logContents);
+
+  // What the descriptor has from its position to its end, zero bytes included. It stays open. `path` is for messages;
+  // with `logContents` the whole text goes into the log at debug severity. A failing read is logged at status severity
+  // and throws kZEPStatusFileSystemError.
+  static std::string GetFileContents(int fd, std::string path, bool logContents);
+
+  // Copies the file into the working directory ("/" when there is none) and opens the copy in vi, by a pattern of the
+  // last 35 characters of its path. A shorter path throws std::out_of_range after the copy. Paths are not quoted for the
+  // shell.
+  static void LaunchTextEditor(std::string path);
 
   // ---- Plug-ins (TOSSpecificPlugins.cpp) ----
   //
@@ -103,8 +240,12 @@ public:
 
   // ---- Machine identification (TOSSpecificMachine.cpp) ----
   //
-  // Read from SMBIOS through the platform library libsmbios.so. What cannot be read is the operation's default, with the
-  // reason in the log at debug severity; nothing throws.
+  // Read from SMBIOS, afresh by each call, through the platform library libsmbios.so, which is loaded when first needed.
+  // What cannot be read is the operation's default, with the reason in the log at debug severity; nothing throws.
+  //
+  // The product description "Server Q100 -[1234AB7]-" is cut at its first "-", wherever that stands: the name is "Server
+  // Q100 " with its blank, the type "1234", the model "AB7". A bare "1234AB7" gives the type alone. A type or model that
+  // is not there in full is not given in part.
 
   // One field of SMBIOS type 1 by key, which is case-sensitive: "type" (machine type, else "0000"), "name" (else
   // "Unknown"), "model" (else "Unknown"), "SN" (serial number, else "Unknown"). Any other key: "error param of
@@ -119,11 +260,12 @@ public:
   // The machine type that the BIOS build prefix stands for, else what GetMachineType gives.
   static std::string GetMachineTypeFromID();
 
-  // The first two characters of the BIOS version of SMBIOS type 0, taken out of its brackets; else "00".
+  // The first two characters of the BIOS version of SMBIOS type 0, taken out of its brackets; "00" when there are no two.
   static std::string GetBiosID();
 
   // Copies string `number` (1 is the first) of an SMBIOS string set of `length` bytes into `output`, which has room for
   // it and was cleared by the caller: for number 1 without, for later ones with its zero byte. 1 when found, 0 otherwise.
+  // The empty string that closes the set is none of its strings. Reads no byte behind `length`.
   static int getBIDString(char* stringSet, char* output, int length, int number);
 
   // ---- Log (TOSSpecificLog.cpp) ----

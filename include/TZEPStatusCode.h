@@ -7,7 +7,7 @@
 namespace NQRVZEP20 {
 
 // The status codes of the whole library. Every failure that is reported by exception carries one of them.
-enum EZEPStatusCode {
+enum EZEPStatusCode : int {
   kZEPStatusOK = 0,
   kZEPStatusNotImplemented,
   kZEPStatusUnknownClass,

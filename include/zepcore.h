@@ -36,6 +36,7 @@
 #include "TCIMValue.h"
 #include "TCIMValueImpl.h"
 #include "TCommUtil.h"
+#include "TConfig.h"
 #include "TLogger.h"
 #include "TNamespaceProviderManager.h"
 #include "TOSSpecific.h"

@@ -11,6 +11,7 @@ namespace {
 unsigned char ByteAt(std::string_view bytes, std::size_t offset) { return static_cast<unsigned char>(bytes[offset]); }
 
 std::vector<std::string> SplitStringSet(std::string_view set) {
+  if (!set.empty() && set.front() == '\0') return {};  // a set without strings is two zero bytes
   std::string spared(set);
   spared.push_back('\0');  // multiStringTok takes the last string only with a byte to spare behind the set
   return TOSSpecific::multiStringTok(spared.data(), spared.size(), '\0');

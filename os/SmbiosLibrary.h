@@ -1,6 +1,5 @@
 #pragma once
 
-#include "core/Handles.h"
 #include "platform/include/smbios.h"
 
 #include <memory>
@@ -9,10 +8,11 @@ namespace NQRVZEP20 {
 
 // The SMBIOS tables of this machine, open through the platform library libsmbios.so for as long as the object lives.
 //
-// The library is loaded at run time by its plain name and then stays loaded, so that opening the tables again is cheap.
+// The library is loaded by its plain name when first needed and then stays loaded; while it cannot be had, each new object
+// tries again.
 class TSmbiosTables {
 public:
-  TSmbiosTables();  // opens them; never throws
+  TSmbiosTables();  // opens them; throws nothing
 
   // What the library said of opening; kZEPStatusFileSystemError when it could not be loaded, kZEPStatusNotFound when it
   // lacks one of its functions.
@@ -28,14 +28,8 @@ public:
   void Close() { fHandle.reset(); }
 
 private:
-  using THandle = std::unique_ptr<void, decltype(&smBiosClose)>;
-
-  TSharedLibrary fLibrary;  // outlives the handle
   int fOpenStatus = 0;
-  decltype(&smBiosGetFirst) fGetFirst = nullptr;
-  THandle fHandle{nullptr, nullptr};
-
-  int Open();
+  std::unique_ptr<void, decltype(&smBiosClose)> fHandle{nullptr, nullptr};
 };
 
 }  // namespace NQRVZEP20

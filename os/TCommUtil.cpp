@@ -2,7 +2,15 @@
 
 #include "TOSSpecific.h"
 
+#include <algorithm>
+
 namespace NQRVZEP20 {
+namespace {
+
+// Letters, digits, punctuation, blank; tab, newline, vertical tab, form feed, carriage return. Whatever the locale is.
+bool IsText(char c) { return (c >= ' ' && c <= '~') || (c >= '\t' && c <= '\r'); }
+
+}  // namespace
 
 void TCommUtil::SplitPath(std::string const& path, std::vector<std::string>& parts, std::string const& separator,
                           bool keepSeparator) {
@@ -24,6 +32,16 @@ void TCommUtil::MkDirHier(std::string const& path) {
     prefix += part;
     if (!TOSSpecific::DirExists(prefix)) TOSSpecific::CreateDir(prefix);
   }
+}
+
+std::string TCommUtil::RemoveSpaces(std::string text) {
+  text.erase(std::min(text.find('\n'), text.size()));
+  text.erase(text.find_last_not_of(' ') + 1);
+  text.erase(0, text.find_first_not_of(' '));
+  // Only now, so that a blank before the carriage return stays. Kept.
+  text.erase(std::min(text.find('\r'), text.size()));
+  if (!std::all_of(text.begin(), text.end(), IsText)) return "";
+  return text;
 }
 
 }  // namespace NQRVZEP20

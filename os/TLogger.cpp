@@ -3,14 +3,18 @@
 #include "TCommUtil.h"
 #include "TOSSpecific.h"
 #include "TZEPException.h"
+#include "os/LocalTime.h"
 
+#include <pthread.h>
+#include <boost/thread/exceptions.hpp>
 #include <boost/thread/lock_guard.hpp>
-#include <boost/thread/tss.hpp>
 
 #include <array>
 #include <atomic>
 #include <cerrno>
+#include <charconv>
 #include <cstdlib>
+#include <iterator>
 #include <memory>
 #include <string_view>
 
@@ -37,28 +41,45 @@ struct TListLife {
   ~TListLife() { gListExists = false; }
 } const gListLife;
 
-// The calling thread's logger, null before its first call and after the thread let it go: GetInstance then costs one load.
+// The calling thread's logger, null before its first call and after its end: GetInstance costs one load.
 thread_local TLogger* tInstance = nullptr;
 
-void DeleteInstance(TLogger* instance) {
+void DeleteInstance(void* instance) {
   tInstance = nullptr;
-  std::unique_ptr<TLogger> const end(instance);
+  std::unique_ptr<TLogger> const end(static_cast<TLogger*>(instance));
 }
 
-// Owns every thread's logger, and ends it with its thread. At the end of the process the owner is destroyed itself, together
-// with the logger of the thread that ends the process.
+void CheckOrThrow(int error) {
+  if (error != 0) throw boost::thread_resource_error(error, "TLogger::GetInstance");
+}
+
+// Ends every thread's logger with its thread, after the thread's own objects; and at the end of the process, where it ends
+// itself, that of the last thread. It does what boost::thread_specific_ptr does, without the library which that needs and
+// with which this one takes twice as long to load.
 std::atomic<bool> gOwnerExists = true;
-struct TOwner {
-  ~TOwner() { gOwnerExists = false; }
-  boost::thread_specific_ptr<TLogger> fSlot{DeleteInstance};
+class TOwner {
+public:
+  TOwner() { CheckOrThrow(::pthread_key_create(&fKey, DeleteInstance)); }
+  ~TOwner() {
+    gOwnerExists = false;
+    ::pthread_key_delete(fKey);
+    DeleteInstance(tInstance);
+  }
+  TOwner(TOwner const&) = delete;
+  TOwner& operator=(TOwner const&) = delete;
+
+  void Own(TLogger* instance) { CheckOrThrow(::pthread_setspecific(fKey, instance)); }
+
+private:
+  pthread_key_t fKey;
 };
 
-// A thread that logs once its logger is gone (from the destructor of a thread-local or static object) gets a new one, which
-// lives to the end of the process where nothing is left to own it.
+// A thread that logs once its logger is gone (from what ends still later) gets a new one. At the end of the process nothing
+// is left to own it, and it is never destroyed.
 TLogger* MakeInstance() {
   static TOwner owner;
   auto instance = std::make_unique<TLogger>();
-  if (gOwnerExists) owner.fSlot.reset(instance.get());
+  if (gOwnerExists) owner.Own(instance.get());
   return instance.release();
 }
 
@@ -70,22 +91,44 @@ bool IsMemoryOnly(ILogger::EZEPLogSeverity severity) {
   return severity == ILogger::kLogMemoryOnly || severity == ILogger::kLogMemoryOnlyAlways;
 }
 
-// "3/3/2024  9:5:7 ", without zero fill. Each field is of a reading of its own: a line that is written across the turn of a
-// second may mix two times. Kept.
-std::string LocalTimeText() {
-  auto const second = std::to_string(TOSSpecific::GetLocalTime().GetSecond());
-  auto const minute = std::to_string(TOSSpecific::GetLocalTime().GetMinute());
-  auto const hour = std::to_string(TOSSpecific::GetLocalTime().GetHour());
-  auto const year = std::to_string(TOSSpecific::GetLocalTime().GetYear());
-  auto const day = std::to_string(TOSSpecific::GetLocalTime().GetDay());
-  auto const month = std::to_string(TOSSpecific::GetLocalTime().GetMonth());
-  return month + "/" + day + "/" + year + "  " + hour + ":" + minute + ":" + second + " ";
+// A text of a few pieces and numbers, built without an allocation.
+class TShortText {
+public:
+  TShortText& operator<<(std::string_view piece) {
+    fSize += piece.copy(fText + fSize, piece.size());
+    return *this;
+  }
+  TShortText& operator<<(int number) {
+    fSize = static_cast<std::size_t>(std::to_chars(fText + fSize, std::end(fText), number).ptr - fText);
+    return *this;
+  }
+  std::string_view View() const { return {fText, fSize}; }
+
+private:
+  char fText[128];  // the widest numbers leave it half empty
+  std::size_t fSize = 0;
+};
+
+// "FDR_[Status] 3/3/2024  9:5:7 ", without zero fill. Each field is of a reading of its own: a line that is written across
+// the turn of a second may mix two times. Kept.
+TShortText HeadOf(ILogger::EZEPLogSeverity severity) {
+  TLocalClock clock;  // that of GetLocalTime
+  int const second = clock.Now().fFields.tm_sec;
+  int const minute = clock.Now().fFields.tm_min;
+  int const hour = clock.Now().fFields.tm_hour;
+  int const year = clock.Now().fFields.tm_year + 1900;
+  int const day = clock.Now().fFields.tm_mday;
+  int const month = clock.Now().fFields.tm_mon + 1;
+  TShortText head;
+  head << "FDR_" << kLabels[severity] << month << "/" << day << "/" << year << "  " << hour << ":" << minute << ":" << second;
+  return head << " ";
 }
 
 std::string LineOf(ILogger::EZEPLogSeverity severity, std::string const& message) {
-  std::string line = "FDR_";
-  line.append(kLabels[severity]).append(LocalTimeText()).append(message).append("\n");
-  return line;
+  TShortText const head = HeadOf(severity);
+  std::string line;
+  line.reserve(head.View().size() + message.size() + 1);
+  return line.append(head.View()).append(message).append("\n");
 }
 
 void Record(ILogger::EZEPLogSeverity severity, std::string const& message) {

@@ -4,8 +4,10 @@
 #include "os/MachineIdentity.h"
 #include "os/SmbiosLibrary.h"
 
-#include <algorithm>
+#include <memory>
 #include <new>
+#include <optional>
+#include <string_view>
 
 namespace NQRVZEP20 {
 namespace {
@@ -95,18 +97,20 @@ constexpr TBiosVersionMessages kGetMachineTypeFromIDMessages = {
 
 // The BIOS version in the structure of type 0 that the buffer holds; empty when it is not in the part looked at.
 std::string BiosVersionIn(char* buffer) {
-  char* const stringSet = buffer + static_cast<unsigned char>(buffer[1]);
-  char version[kBiosStringArea + 1] = {};
-  TOSSpecific::getBIDString(stringSet, version, kBiosStringArea, static_cast<unsigned char>(buffer[kBiosVersion]));
+  const std::size_t formattedLength = static_cast<unsigned char>(buffer[1]);
+  if (formattedLength <= kBiosVersion) return {};
+  char version[kBiosStringArea] = {};
+  TOSSpecific::getBIDString(buffer + formattedLength, version, kBiosStringArea, static_cast<unsigned char>(buffer[kBiosVersion]));
   return CleanBiosVersion(version);
 }
 
 // The cleaned BIOS version of SMBIOS type 0, empty when the read failed. Nothing when the tables cannot be opened or hold
-// no such structure.
-std::optional<std::string> ReadBiosVersion(TSmbiosTables& tables, TBiosVersionMessages const& messages) {
+// no such structure. The tables stay open with `tables`.
+std::optional<std::string> ReadBiosVersion(std::optional<TSmbiosTables>& tables, TBiosVersionMessages const& messages) {
   constexpr int kBufferSize = 4096;
   const std::unique_ptr<char[]> buffer = NewClearedBuffer(kBufferSize);
-  const int openStatus = buffer ? tables.OpenStatus() : kZEPStatusOutOfMemory;
+  if (buffer) tables.emplace();
+  const int openStatus = tables ? tables->OpenStatus() : kZEPStatusOutOfMemory;
   if (openStatus != kZEPStatusOK) {
     LogDebug(messages.unableToOpen, openStatus);
     return std::nullopt;
@@ -114,7 +118,7 @@ std::optional<std::string> ReadBiosVersion(TSmbiosTables& tables, TBiosVersionMe
 
   LogDebug(messages.retrieving);
   int length = 0;
-  const int status = tables.GetFirst(kBiosInformation, buffer.get(), kBufferSize, length);
+  const int status = tables->GetFirst(kBiosInformation, buffer.get(), kBufferSize, length);
   if (status == kZEPStatusFail) {
     LogDebug(messages.readFailed);
     return std::string();
@@ -160,7 +164,7 @@ std::string TOSSpecific::GetMachineType() {
 
 std::string TOSSpecific::GetMachineTypeFromID() {
   const std::string type = GetMachineType();
-  TSmbiosTables tables;
+  std::optional<TSmbiosTables> tables;
   if (const std::optional<std::string> version = ReadBiosVersion(tables, kGetMachineTypeFromIDMessages)) {
     const std::string buildNumber = LowerCase(*version);
     LogDebug("TOSSpecific::GetMachineTypeFromID - buildNumber is ", buildNumber);
@@ -174,10 +178,10 @@ std::string TOSSpecific::GetMachineTypeFromID() {
 }
 
 std::string TOSSpecific::GetBiosID() {
-  TSmbiosTables tables;
+  std::optional<TSmbiosTables> tables;
   const std::optional<std::string> version = ReadBiosVersion(tables, kGetBiosIDMessages);
   if (!version) return kNoBiosID;
-  const std::string biosID = version->size() < 2 ? kNoBiosID : version->substr(0, 2);
+  const std::string biosID = version->empty() ? kNoBiosID : version->substr(0, 2);
   LogDebug("TOSSpecific::GetBiosID - biosID = ", biosID);
   return biosID;
 }

@@ -2,6 +2,7 @@
 #include "TZEPException.h"
 #include "core/Handles.h"
 #include "core/Log.h"
+#include "os/Directories.h"
 
 #include <dlfcn.h>
 
@@ -30,14 +31,6 @@ char const* FileOfThisLibrary() {
   if (::dladdr(reinterpret_cast<void*>(&FileOfThisLibrary), &info) == 0) return nullptr;
   return info.dli_fname;
 }
-
-TUniqueDir OpenDirOrThrow(std::string const& path) {
-  TUniqueDir dir(::opendir(path.c_str()));
-  if (!dir) throw TZEPException(kZEPStatusFileSystemError);
-  return dir;
-}
-
-bool IsDotOrDotDot(std::string const& name) { return name == "." || name == ".."; }
 
 bool Holds(std::string const& text, std::string const& piece) { return text.find(piece) != std::string::npos; }
 
@@ -85,7 +78,8 @@ std::string TOSSpecific::GetZEPRootPath() {
   std::string const path = file;
   // Refused rather than cut short: what is left of a longer name would name another directory.
   if (path.size() > kLongestFileName) throw TZEPException(kZEPStatusFileSystemError);
-  return path.substr(0, path.rfind(kFileSeparator));
+  std::size_t const separator = path.rfind(kFileSeparator);
+  return separator == path.npos ? "." : path.substr(0, separator);  // a bare name was found in the working directory
 }
 
 std::vector<std::string> TOSSpecific::FindPlugins(std::string root, std::string kind) {

@@ -4,8 +4,9 @@
 
 #include "tests/Support.h"
 
+#include <cstdio>
+#include <stdexcept>
 #include <string>
-#include <string_view>
 #include <vector>
 
 namespace NQRVZEP20 {

@@ -5,17 +5,16 @@
 #include "ILogger.h"
 #include "TLogger.h"
 #include "TRootObject.h"
+#include "TestPaths.h"
 #include "TZEPException.h"
 
 #include <gtest/gtest.h>
 #include <stdlib.h>
 
-#include <exception>
 #include <filesystem>
 #include <fstream>
-#include <regex>
+#include <functional>
 #include <sstream>
-#include <stdexcept>
 #include <string>
 #include <thread>
 #include <vector>
@@ -48,15 +47,8 @@ namespace NQRVZEP20 {
 // A fresh directory, removed with everything in it at the end.
 class TTempDir {
 public:
-  TTempDir() {
-    std::string pattern = (std::filesystem::temp_directory_path() / "zep-test.XXXXXX").string();
-    if (::mkdtemp(pattern.data()) == nullptr) throw std::runtime_error("no temporary directory");
-    fPath = pattern;
-  }
-  ~TTempDir() {
-    std::error_code ignored;
-    std::filesystem::remove_all(fPath, ignored);
-  }
+  TTempDir();
+  ~TTempDir();
   TTempDir(TTempDir const&) = delete;
   TTempDir& operator=(TTempDir const&) = delete;
 
@@ -70,11 +62,8 @@ private:
 // Sets or unsets (nullptr) an environment variable, and puts it back at the end.
 class TEnvironmentGuard {
 public:
-  TEnvironmentGuard(char const* name, char const* value) : fName(name) {
-    if (char const* old = ::getenv(name)) fOld = std::string(old), fWasSet = true;
-    value ? ::setenv(name, value, 1) : ::unsetenv(name);
-  }
-  ~TEnvironmentGuard() { fWasSet ? ::setenv(fName.c_str(), fOld.c_str(), 1) : ::unsetenv(fName.c_str()); }
+  TEnvironmentGuard(char const* name, char const* value);
+  ~TEnvironmentGuard();
   TEnvironmentGuard(TEnvironmentGuard const&) = delete;
   TEnvironmentGuard& operator=(TEnvironmentGuard const&) = delete;
 
@@ -83,50 +72,23 @@ private:
   bool fWasSet = false;
 };
 
-inline std::string ReadFile(std::string const& path) {
-  std::ifstream file(path, std::ios::binary);
-  std::ostringstream text;
-  text << file.rdbuf();
-  return text.str();
-}
-
-inline void WriteFile(std::string const& path, std::string const& text) { std::ofstream(path, std::ios::binary) << text; }
+std::string ReadFile(std::string const& path);
+void WriteFile(std::string const& path, std::string const& text);
 
 // The messages that the in-memory log holds (severities up to Status), oldest first.
-inline std::vector<std::string> LoggedMessages() {
-  std::vector<std::string> messages;
-  for (auto const& entry : TRootObject::GetCoreLogger()->GetLog()) messages.push_back(entry.fMessage);
-  return messages;
-}
+std::vector<std::string> LoggedMessages();
 
 // Lets everything through to a log file of the calling thread, and puts the threshold back at the end. Use it on a thread
 // of the test's own (OnNewThread) when the test needs the thread's logger untouched before and after.
 class TLogCapture {
 public:
-  TLogCapture() : fOldThreshold(TLogger::GetInstance()->GetLogThreshold()) {
-    TLogger::SetLogThreshold(ILogger::kLogVerbose);
-    TLogger::GetInstance()->SetLogFilename(fDir.Path("log"));
-  }
-  ~TLogCapture() { TLogger::SetLogThreshold(fOldThreshold); }
+  TLogCapture();
+  ~TLogCapture();
   TLogCapture(TLogCapture const&) = delete;
   TLogCapture& operator=(TLogCapture const&) = delete;
 
   // What was written so far, without times: "[Debug] getMachineType() entered.". A message of several lines is one element.
-  std::vector<std::string> Entries() const {
-    std::vector<std::string> entries;
-    std::istringstream log(ReadFile(fDir.Path("log")));
-    std::string line;
-    std::getline(log, line);  // the opening banner
-    while (std::getline(log, line)) {
-      static std::regex const head("FDR_(\\[[A-Z][a-z]+\\] )\\d+/\\d+/\\d+  \\d+:\\d+:\\d+ ");
-      std::smatch match;
-      if (std::regex_search(line, match, head, std::regex_constants::match_continuous))
-        entries.push_back(match[1].str() + match.suffix().str());
-      else if (!entries.empty())
-        entries.back() += "\n" + line;
-    }
-    return entries;
-  }
+  std::vector<std::string> Entries() const;
 
 private:
   TTempDir fDir;
@@ -134,9 +96,6 @@ private:
 };
 
 // Runs the function on a thread of its own, which has a fresh logger that ends with it.
-template <class TFunction>
-void OnNewThread(TFunction function) {
-  std::thread(function).join();
-}
+void OnNewThread(std::function<void()> const& function);
 
 }  // namespace NQRVZEP20

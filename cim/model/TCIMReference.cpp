@@ -2,8 +2,6 @@
 
 #include "TCIMReferenceImpl.h"
 
-#include <boost/assert.hpp>
-
 namespace NQRVZEP20 {
 
 TCIMReference::TCIMReference(boost::shared_ptr<ICIMNamespace> ns, TCIMContext context)
@@ -57,11 +55,6 @@ boost::shared_ptr<ICIMElement> TCIMReference::GetCIMElement(bool classOnly) cons
 
 bool TCIMReference::operator==(TCIMReference const& other) const { return Body() == other.Body(); }
 bool TCIMReference::operator<(TCIMReference const& other) const { return Body() < other.Body(); }
-
-TCIMReferenceImpl& TCIMReference::Body() const {
-  BOOST_ASSERT(fBody != nullptr);
-  return *fBody;
-}
 
 void TCIMReference::BindBody() noexcept {
   if (fBody) fBody->SetOwner(*this);

@@ -15,6 +15,7 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr std::size_t kNowhere = std::string::npos;
+constexpr int kMaxDepth = 100;  // of references among the keys of references; a path comes from outside
 
 [[noreturn]] void ThrowInvalidReference(std::string_view reason, std::string const& path) {
   LogError(reason, path);
@@ -46,6 +47,12 @@ std::string ReadQuotedText(std::string const& path, std::size_t& pos) {
   return text;
 }
 
+TCIMValue ReadValue(boost::shared_ptr<ICIMNamespace> const& ns, ICIMPropertyDecl const& declaration, std::string const& path,
+                    std::size_t& pos) {
+  std::string text = ReadQuotedText(path, pos);
+  return TCIMValue(declaration.GetType(TCIMContext()), text, ns);
+}
+
 void AppendEscaped(std::string& path, std::string_view text) {
   for (char const c : text) {
     if (c == '"' || c == '\\') path += '\\';
@@ -59,6 +66,19 @@ boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(ICIMClass const& cls, s
   auto declaration = cls.GetPropertyDecl(name, TCIMContext());
   if (!declaration) throw TZEPException(kZEPStatusNotFound);
   return declaration;
+}
+
+// What std::map's own < says, with each name compared once.
+bool AreKeysLess(std::map<std::string, TCIMValue> const& a, std::map<std::string, TCIMValue> const& b) {
+  auto mine = a.begin();
+  auto theirs = b.begin();
+  for (; mine != a.end() && theirs != b.end(); ++mine, ++theirs) {
+    int const order = mine->first.compare(theirs->first);
+    if (order != 0) return order < 0;
+    if (mine->second < theirs->second) return true;
+    if (theirs->second < mine->second) return false;
+  }
+  return mine == a.end() && theirs != b.end();
 }
 
 std::string TypeMismatchText(TCIMValue::TCIMType declared, TCIMValue::TCIMType given) {
@@ -105,27 +125,27 @@ std::string TCIMReferenceImpl::GetPath() const {
 // ---- Parsing ----
 
 void TCIMReferenceImpl::SetPath(std::string const& path) {
-  auto const ns = fNamespace.lock();  // held until the path is read
-  if (!ns || fClass || !fKeys.empty()) throw TZEPException(kZEPStatusInvalidOpSequence);
+  if (fNamespace.expired() || fClass || !fKeys.empty()) throw TZEPException(kZEPStatusInvalidOpSequence);
   std::size_t pos = 0;
   ParsePath(*this, path, pos);
 }
 
 void TCIMReferenceImpl::ParsePath(TCIMReferenceImpl& target, std::string const& path, std::size_t& pos) {
+  boost::shared_ptr<ICIMNamespace> const ns(target.fNamespace);  // held until the path is read
   bool const isNested = pos != 0;
   if (isNested) ++pos;  // the opening quote
 
   std::size_t const end = std::min(FindEndOfClass(path, pos), path.size());
-  target.ReadClass(path, pos, end);
+  target.ReadClass(*ns, path, pos, end);
   pos = end;
-  while (!IsEndOfKeys(path, pos, isNested)) pos = target.ReadKeyBinding(path, pos);
+  while (!IsEndOfKeys(path, pos, isNested)) pos = target.ReadKeyBinding(ns, path, pos);
 }
 
-void TCIMReferenceImpl::ReadClass(std::string const& path, std::size_t begin, std::size_t end) {
+void TCIMReferenceImpl::ReadClass(ICIMNamespace const& ns, std::string const& path, std::size_t begin, std::size_t end) {
   std::size_t const colon = path.find(':', begin);
   if (colon < end) begin = colon + 1;
   try {
-    SetClassName(path.substr(begin, end - begin));
+    LookUpClass(ns, path.substr(begin, end - begin));
   } catch (TZEPException const& failure) {
     if (failure.GetStatusCode() != kZEPStatusNotFound) throw;
     ThrowInvalidReference("Reference specifies invalid class, path=", path);
@@ -133,7 +153,8 @@ void TCIMReferenceImpl::ReadClass(std::string const& path, std::size_t begin, st
 }
 
 // Reads `,name="value"` and returns the position behind it.
-std::size_t TCIMReferenceImpl::ReadKeyBinding(std::string const& path, std::size_t pos) {
+std::size_t TCIMReferenceImpl::ReadKeyBinding(boost::shared_ptr<ICIMNamespace> const& ns, std::string const& path,
+                                              std::size_t pos) {
   if (path[pos] != ',' && path[pos] != '.') ThrowInvalidReference("Reference missing '.' or ',', path=", path);
   std::size_t const equals = path.find('=', pos);
   if (equals == kNowhere) ThrowInvalidReference("Reference missing property value, path=", path);
@@ -143,7 +164,7 @@ std::size_t TCIMReferenceImpl::ReadKeyBinding(std::string const& path, std::size
   if (pos == path.size() || path[pos] != '"') ThrowInvalidReference("Reference missing opening '\"', path=", path);
 
   bool const isReference = declaration->GetDefaultValue(TCIMContext()).IsReference();
-  TCIMValue value = isReference ? ReadReference(path, pos) : ReadValue(*declaration, path, pos);
+  TCIMValue value = isReference ? ReadReference(ns, path, pos) : ReadValue(ns, *declaration, path, pos);
   fKeys.emplace(std::move(name), std::move(value));  // the first binding of a name stays. Kept.
   return std::min(pos + 1, path.size());
 }
@@ -159,15 +180,13 @@ boost::shared_ptr<ICIMPropertyDecl const> TCIMReferenceImpl::ReadDeclaration(std
 }
 
 // Reads a path between quotes, which are not escaped inside it; `pos` goes from the opening to the closing quote.
-TCIMValue TCIMReferenceImpl::ReadReference(std::string const& path, std::size_t& pos) const {
-  TCIMReference reference(GetNamespace(), fContext);
+TCIMValue TCIMReferenceImpl::ReadReference(boost::shared_ptr<ICIMNamespace> const& ns, std::string const& path,
+                                           std::size_t& pos) const {
+  if (fDepth == kMaxDepth) ThrowInvalidReference("Reference nested too deeply, path=", path);
+  TCIMReference reference(ns, fContext);
+  reference.GetBody()->fDepth = fDepth + 1;
   ParsePath(*reference.GetBody(), path, pos);
   return TCIMValue(reference);
-}
-
-TCIMValue TCIMReferenceImpl::ReadValue(ICIMPropertyDecl const& declaration, std::string const& path, std::size_t& pos) const {
-  std::string text = ReadQuotedText(path, pos);
-  return TCIMValue(declaration.GetType(TCIMContext()), text, GetNamespace());
 }
 
 // ---- Parts ----
@@ -181,7 +200,14 @@ std::string TCIMReferenceImpl::GetClassName() const { return fClass->GetName(TCI
 
 void TCIMReferenceImpl::SetClassName(std::string const& name) {
   boost::shared_ptr<ICIMNamespace> const ns(fNamespace);  // throws boost::bad_weak_ptr when it is gone
-  SetClass(ns->GetClass(name, TCIMContext(fContext)));
+  LookUpClass(*ns, name);
+}
+
+// An unknown class, too, may be reported by an empty pointer. Both throw kZEPStatusNotFound here.
+void TCIMReferenceImpl::LookUpClass(ICIMNamespace const& ns, std::string const& name) {
+  boost::shared_ptr<ICIMClass> cls = ns.GetClass(name, fContext);
+  if (!cls) throw TZEPException(kZEPStatusNotFound);
+  SetClass(std::move(cls));
 }
 
 void TCIMReferenceImpl::AddKeyValue(std::string const& name, TCIMValue const& value) {
@@ -222,7 +248,7 @@ bool TCIMReferenceImpl::operator==(TCIMReferenceImpl const& other) const {
 }
 
 bool TCIMReferenceImpl::operator<(TCIMReferenceImpl const& other) const {
-  if (fClass == other.fClass) return fKeys < other.fKeys;
+  if (fClass == other.fClass) return AreKeysLess(fKeys, other.fKeys);
   return fClass.owner_before(other.fClass);
 }
 

@@ -56,9 +56,15 @@ boost::shared_ptr<ICIMProperty> FindProperty(ICIMInstance const& instance, std::
   return FindOrEmpty([&] { return instance.GetProperty(name, context); });
 }
 
+// Empty when the enumeration throws kZEPStatusNotFound.
 TInstances InstancesOf(ICIMClass const& cls, TCIMContext const& context) {
   TInstances instances;
-  cls.EnumerateInstances(TAddToVectorCallback<ICIMInstance>(instances), context);
+  try {
+    cls.EnumerateInstances(TAddToVectorCallback<ICIMInstance>(instances), context);
+  } catch (TZEPException const& failure) {
+    if (failure.GetStatusCode() != kZEPStatusNotFound) throw;
+    instances.clear();
+  }
   return instances;
 }
 
@@ -114,6 +120,12 @@ TInstances FindInstances(ICIMNamespace const& ns, std::string const& className, 
 }
 
 bool IsString(TCIMValue const& value) { return value.GetType() == TCIMValue::TCIMType::kCIMTypeString && !value.IsNull(); }
+
+// Hosts give a build number as a text or as a number.
+bool IsStringOrInteger(TCIMValue const& value) {
+  TCIMValue::TCIMType const type = value.GetType();
+  return IsString(value) || (type >= TCIMValue::TCIMType::kCIMTypeUint8 && type <= TCIMValue::TCIMType::kCIMTypeSint64);
+}
 
 // ---- Texts ----
 
@@ -324,8 +336,10 @@ std::string TCIMSchemaHelper::GetMTM_vmwesxi(boost::shared_ptr<ICIMNamespace> ns
 std::string TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(boost::shared_ptr<ICIMNamespace> ns) {
   TCIMContext const context = QueryContext();
   TInstances const software = FindInstances(*ns, "VMware_HypervisorSoftwareIdentity", context);
-  std::vector<TCIMValue> const builds = ReadEveryInstance(software, "LargeBuildNumber", context);
-  return builds.empty() ? kUnknown : builds.back().ToString(10);  // a host may give it as a number
+  std::string name = kUnknown;
+  for (TCIMValue const& build : ReadEveryInstance(software, "LargeBuildNumber", context))
+    if (IsStringOrInteger(build)) name = build.ToString(10);
+  return name;
 }
 
 std::string TCIMSchemaHelper::GetSerialNumber_vmwesxi(boost::shared_ptr<ICIMNamespace> ns, TCIMContext context) {

@@ -12,7 +12,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-// The range in which SixDigitsOf needs no power of five above the table's, and no more than 128 bits.
+// The range in which SixDigitsOf needs no more than 128 bits, and of the powers of five those up to 27.
 constexpr double kLeastExact = 1e-21;
 constexpr double kBeyondExact = 1e22;
 

@@ -157,14 +157,14 @@ char* TCIMNumericValueImpl::PutText(char* place, unsigned char radix) const {
 
 bool TCIMNumericValueImpl::operator==(TCIMValue const& other) const {
   if (other.GetType() != fType) return false;
-  auto const& theirs = DataOf<TCIMNumericValueImpl>(other);
-  return OnNumber<bool>(fType, *this, [&](auto mine) { return mine == Stored<decltype(mine)>(theirs); });
+  return OnNumber<bool>(fType, *this,
+                        [&](auto mine) { return mine == Stored<decltype(mine)>(DataOf<TCIMNumericValueImpl>(other)); });
 }
 
 bool TCIMNumericValueImpl::operator<(TCIMValue const& other) const {
   if (other.GetType() != fType) return false;
-  auto const& theirs = DataOf<TCIMNumericValueImpl>(other);
-  return OnNumber<bool>(fType, *this, [&](auto mine) { return Stored<decltype(mine)>(theirs) > mine; });
+  return OnNumber<bool>(fType, *this,
+                        [&](auto mine) { return Stored<decltype(mine)>(DataOf<TCIMNumericValueImpl>(other)) > mine; });
 }
 
 }  // namespace NQRVZEP20

@@ -12,18 +12,23 @@
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>
+#include <ctime>
 #include <memory>
+#include <mutex>
 #include <new>
 #include <string>
+#include <tuple>
 
 namespace {
 
 constexpr char const* kKernelTable = "/sys/firmware/dmi/tables/DMI";
 constexpr std::size_t kMaxFileSize = 16u << 20;
 
+using TContents = std::shared_ptr<std::string const>;
+
 // An open handle: the file as it was read, and the place behind the structure handed out last.
 struct THandle {
-  std::string file;
+  TContents file;
   std::string_view table;  // into `file`
   smbios::TStructureReader place;
 };
@@ -55,29 +60,73 @@ int StatusOfOpenError(int error) {
   return kSmbiosFail;
 }
 
-// Reads a regular file whole, up to the limit. One byte of room more than the file has shows its end with the first read.
-int ReadRegularFile(char const* path, std::string& contents) {
-  const TOpenFile file(path);
-  if (file.Fd() < 0) return StatusOfOpenError(errno);
-  struct stat status;
-  if (::fstat(file.Fd(), &status) != 0 || !S_ISREG(status.st_mode)) return kSmbiosFail;
+// The file read last. It need not be read again while it is the same file with the same time of change.
+class TLastFile {
+public:
+  // Null when that is not the file, or it has changed.
+  TContents Find(struct stat const& status) const {
+    const std::lock_guard<std::mutex> lock(fMutex);
+    return fState == StateOf(status) ? fContents : nullptr;
+  }
 
-  contents.resize(std::min(static_cast<std::size_t>(status.st_size) + 1, kMaxFileSize));
+  // Changes within one tick of the clock look alike: a file is kept only once its last change lies back far enough.
+  void Keep(struct stat const& status, TContents contents) {
+    constexpr std::time_t kSettledAfterSeconds = 1;
+    if (std::time(nullptr) - status.st_ctim.tv_sec <= kSettledAfterSeconds) return;
+    const std::lock_guard<std::mutex> lock(fMutex);
+    fState = StateOf(status);
+    fContents = std::move(contents);
+  }
+
+private:
+  using TState = std::tuple<dev_t, ino_t, off_t, std::time_t, long>;
+
+  static TState StateOf(struct stat const& status) {
+    return {status.st_dev, status.st_ino, status.st_size, status.st_ctim.tv_sec, status.st_ctim.tv_nsec};
+  }
+
+  mutable std::mutex fMutex;
+  TState fState;
+  TContents fContents;  // null: none yet
+};
+
+TLastFile& LastFile() {
+  static TLastFile* const lastFile = std::make_unique<TLastFile>().release();  // to the end of the process
+  return *lastFile;
+}
+
+// Reads a file of that size whole, up to the limit. One byte of room more than the size shows the end with the first read.
+bool ReadWhole(int fd, std::size_t size, std::string& contents) {
+  contents.resize(std::min(size + 1, kMaxFileSize));
   std::size_t filled = 0;
   while (filled < contents.size()) {
-    const ssize_t got = ::read(file.Fd(), contents.data() + filled, contents.size() - filled);
-    if (got < 0) return kSmbiosFail;
+    const ssize_t got = ::read(fd, contents.data() + filled, contents.size() - filled);
+    if (got < 0) return false;
     if (got == 0) break;
     filled += static_cast<std::size_t>(got);
   }
   contents.resize(filled);
+  return true;
+}
+
+int ReadRegularFile(char const* path, TContents& contents) {
+  struct stat status;
+  if (::stat(path, &status) == 0 && (contents = LastFile().Find(status))) return kSmbiosOk;
+
+  const TOpenFile file(path);
+  if (file.Fd() < 0) return StatusOfOpenError(errno);
+  if (::fstat(file.Fd(), &status) != 0 || !S_ISREG(status.st_mode)) return kSmbiosFail;
+  const auto whole = std::make_shared<std::string>();
+  if (!ReadWhole(file.Fd(), static_cast<std::size_t>(status.st_size), *whole)) return kSmbiosFail;
+  contents = whole;
+  LastFile().Keep(status, contents);
   return kSmbiosOk;
 }
 
 int Load(void** handle) {
   auto loaded = std::make_unique<THandle>();
   if (const int status = ReadRegularFile(TablePath(), loaded->file); status != kSmbiosOk) return status;
-  loaded->table = smbios::DmiTableIn(loaded->file);
+  loaded->table = smbios::DmiTableIn(*loaded->file);
   if (loaded->table.empty()) return kSmbiosFail;
   loaded->place = smbios::TStructureReader(loaded->table);
   *handle = loaded.release();

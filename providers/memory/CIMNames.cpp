@@ -1,4 +1,4 @@
-#include "providers/memory/CIMNames.h"
+#include "CIMNames.h"
 
 #include "TZEPException.h"
 

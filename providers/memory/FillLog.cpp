@@ -1,4 +1,4 @@
-#include "providers/memory/FillLog.h"
+#include "FillLog.h"
 
 #include "ILogger.h"
 #include "TRootObject.h"

@@ -1,7 +1,7 @@
-#include "providers/memory/Fitting.h"
+#include "Fitting.h"
 
+#include "CIMTypes.h"
 #include "ICIMNamespace.h"
-#include "providers/memory/CIMTypes.h"
 
 namespace NQRVZEP20 {
 

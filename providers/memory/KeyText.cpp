@@ -1,16 +1,35 @@
-#include "providers/memory/KeyText.h"
+#include "KeyText.h"
 
+#include "CIMNames.h"
 #include "ICIMClass.h"
-#include "providers/memory/CIMNames.h"
+#include "TZEPException.h"
 
+#include <charconv>
 #include <map>
 
 namespace NQRVZEP20 {
 
 namespace {
 
+// A value that holds a NULL char16 or datetime cannot be printed; its text is empty, as that of no other char16 or datetime.
+std::string PlainText(TCIMValue const& value) {
+  try {
+    return value.ToString();
+  } catch (TZEPException const&) {
+    return "";
+  }
+}
+
+// Every digit: values that differ print the same in the six that ToString gives.
+std::string ExactText(double number) {
+  char text[32];
+  return std::string(text, std::to_chars(text, text + sizeof text, number).ptr);
+}
+
 std::string ValueText(TCIMValue const& value) {
-  if (!value.IsReference()) return value.ToString();
+  if (value.GetType() == TCIMValue::TCIMType::kCIMTypeReal64) return ExactText(value);
+  if (value.GetType() == TCIMValue::TCIMType::kCIMTypeReal32) return ExactText(value.operator float());
+  if (!value.IsReference()) return PlainText(value);
   const TCIMReference path = value;
   const boost::shared_ptr<ICIMClass> cls = path.GetClass();
   return (cls ? FoldName(cls->GetName(TCIMContext())) : std::string()) + "." + KeyText(path);

@@ -1,7 +1,7 @@
-#include "providers/memory/StandardQualifiers.h"
+#include "StandardQualifiers.h"
 
+#include "CIMTypes.h"
 #include "ICIMQualifierDecl.h"
-#include "providers/memory/CIMTypes.h"
 
 namespace NQRVZEP20 {
 

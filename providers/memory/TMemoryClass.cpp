@@ -1,9 +1,9 @@
-#include "providers/memory/TMemoryClass.h"
+#include "TMemoryClass.h"
 
-#include "providers/memory/CIMTypes.h"
-#include "providers/memory/FillLog.h"
-#include "providers/memory/KeyText.h"
-#include "providers/memory/TMemoryNamespace.h"
+#include "CIMTypes.h"
+#include "FillLog.h"
+#include "KeyText.h"
+#include "TMemoryNamespace.h"
 
 namespace NQRVZEP20 {
 
@@ -15,10 +15,11 @@ boost::shared_ptr<ICIMNamespace> TMemoryClass::GetNamespace(TCIMContext const&) 
   return boost::shared_ptr<ICIMNamespace>(Namespace());
 }
 
-bool TMemoryClass::GetClassFlag(TCIMContext const& context) const {
+bool TMemoryClass::GetClassFlag(TCIMContext const&) const {
   if (IsMarked("Association")) return true;
-  const boost::shared_ptr<TMemoryClass> superClass = SuperClass();
-  return superClass && superClass->GetClassFlag(context);
+  for (boost::shared_ptr<TMemoryClass> cls = SuperClass(); cls; cls = cls->SuperClass())
+    if (cls->IsMarked("Association")) return true;
+  return false;
 }
 
 bool TMemoryClass::IsAbstract(TCIMContext const&) const { return IsMarked("Abstract"); }
@@ -112,7 +113,8 @@ void TMemoryClass::CommitInstance(boost::shared_ptr<ICIMInstance> instance, TCIM
 
 boost::shared_ptr<TMemoryInstance> TMemoryClass::AddInstance(TMemoryValues const& values) {
   const TCIMContext none;
-  const auto instance = boost::static_pointer_cast<TMemoryInstance>(CreateInstance(none));
+  const auto created = NameRefusal(Name(), "", [&] { return CreateInstance(none); });
+  const auto instance = boost::static_pointer_cast<TMemoryInstance>(created);
   for (auto const& entry : values) NameRefusal(Name(), entry.first, [&] { instance->Set(entry.first, entry.second); });
   NameRefusal(Name(), "", [&] { CommitInstance(instance, none); });
   return instance;
@@ -123,9 +125,10 @@ boost::shared_ptr<TMemoryClass> TMemoryClass::SuperClass() const {
 }
 
 boost::shared_ptr<TMemoryPropertyDecl> TMemoryClass::FindPropertyDecl(std::string const& name) const {
-  if (const auto own = fPropertyDecls.Find(name)) return own;
-  const boost::shared_ptr<TMemoryClass> superClass = SuperClass();
-  return superClass ? superClass->FindPropertyDecl(name) : boost::shared_ptr<TMemoryPropertyDecl>();
+  boost::shared_ptr<TMemoryPropertyDecl> found = fPropertyDecls.Find(name);
+  for (boost::shared_ptr<TMemoryClass> cls = SuperClass(); cls && !found; cls = cls->SuperClass())
+    found = cls->fPropertyDecls.Find(name);
+  return found;
 }
 
 boost::shared_ptr<TMemoryInstance> TMemoryClass::FindInstance(TCIMReference const& path) const {
@@ -134,6 +137,7 @@ boost::shared_ptr<TMemoryInstance> TMemoryClass::FindInstance(TCIMReference cons
 }
 
 void TMemoryClass::Empty() {
+  for (auto const& instance : fInstances) instance->DropReferences();
   fInstancesByKeys.clear();
   fInstances.clear();
   fLayout.reset();

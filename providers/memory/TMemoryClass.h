@@ -1,10 +1,10 @@
 #pragma once
 
 #include "ICIMClass.h"
-#include "providers/memory/TMemoryInstance.h"
-#include "providers/memory/TMemoryMethodDecl.h"
-#include "providers/memory/TMemoryNamedElement.h"
-#include "providers/memory/TMemoryPropertyDecl.h"
+#include "TMemoryInstance.h"
+#include "TMemoryMethodDecl.h"
+#include "TMemoryNamedElement.h"
+#include "TMemoryPropertyDecl.h"
 
 #include <string>
 #include <unordered_map>
@@ -15,9 +15,6 @@ namespace NQRVZEP20 {
 class TMemoryNamespace;
 
 // A class. Made by TMemoryNamespace, which owns it; a class that outlives its namespace is empty.
-//
-// Beyond what the interfaces say: names that are no CIM names are refused with kZEPStatusInvalidCIMName, and a class and
-// its superclasses take no more property declarations, and no more Key qualifiers, once CreateInstance was called.
 class TMemoryClass : public TMemoryNamedElement<ICIMClass> {
 public:
   TMemoryClass(boost::weak_ptr<TMemoryNamespace> ns, boost::shared_ptr<TMemoryClass> superClass, std::string const& name);
@@ -55,8 +52,8 @@ public:
 
   // ---- Filling ----
 
-  // Creates an instance, sets the values and commits it. A value that is refused is named in the log, as an error, before
-  // the exception passes on.
+  // Creates an instance, sets the values and commits it. What is refused is named in the log, as an error, before the
+  // exception passes on.
   boost::shared_ptr<TMemoryInstance> AddInstance(TMemoryValues const& values);
 
   // ---- For the other classes of this library ----

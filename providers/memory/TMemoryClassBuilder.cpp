@@ -1,8 +1,8 @@
-#include "providers/memory/TMemoryClassBuilder.h"
+#include "TMemoryClassBuilder.h"
 
-#include "providers/memory/FillLog.h"
-#include "providers/memory/Fitting.h"
-#include "providers/memory/TMemoryClass.h"
+#include "FillLog.h"
+#include "Fitting.h"
+#include "TMemoryClass.h"
 
 namespace NQRVZEP20 {
 

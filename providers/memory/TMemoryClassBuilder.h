@@ -1,7 +1,7 @@
 #pragma once
 
 #include "TCIMValue.h"
-#include "providers/memory/TMemoryType.h"
+#include "TMemoryType.h"
 
 #include <boost/shared_ptr.hpp>
 
@@ -40,7 +40,8 @@ public:
   // A property whose value belongs to the class.
   TMemoryClassBuilder& Static(std::string const& name, TMemoryType const& type, TCIMValue const& value);
 
-  // ---- Methods, and the parameters of the method described last ----
+  // ---- Methods, and the parameters of the method described last. What goes in and comes out is an In with the qualifier
+  //      Out. ----
 
   TMemoryClassBuilder& Method(std::string const& name, TMemoryType const& returnType);
   TMemoryClassBuilder& In(std::string const& name, TMemoryType const& type);

@@ -1,9 +1,9 @@
-#include "providers/memory/TMemoryInstance.h"
+#include "TMemoryInstance.h"
 
+#include "Fitting.h"
+#include "TMemoryClass.h"
+#include "TMemoryPropertyDecl.h"
 #include "TZEPException.h"
-#include "providers/memory/Fitting.h"
-#include "providers/memory/TMemoryClass.h"
-#include "providers/memory/TMemoryPropertyDecl.h"
 
 #include <boost/make_shared.hpp>
 
@@ -54,6 +54,10 @@ TCIMValue TMemoryInstance::GetReference() const {
 void TMemoryInstance::SetCommitted() {
   fIsCommitted = true;
   for (const std::size_t key : fLayout->fKeys) fProperties[key]->Fix();
+}
+
+void TMemoryInstance::DropReferences() {
+  for (auto const& property : fProperties) property->DropReference();
 }
 
 TMemoryProperty& TMemoryInstance::PropertyOf(std::string const& name) const {

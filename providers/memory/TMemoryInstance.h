@@ -2,8 +2,8 @@
 
 #include "ICIMInstance.h"
 #include "TCIMValue.h"
-#include "providers/memory/TMemoryProperty.h"
-#include "providers/memory/TNamedList.h"
+#include "TMemoryProperty.h"
+#include "TNamedList.h"
 
 #include <string>
 #include <utility>
@@ -52,6 +52,9 @@ public:
 
   bool IsCommitted() const { return fIsCommitted; }
   void SetCommitted();  // its keys are fixed from now on
+
+  // Makes its references NULL: a reference that was resolved owns the instance that it found, and that may be this one.
+  void DropReferences();
 
 private:
   TMemoryProperty& PropertyOf(std::string const& name) const;  // or throws kZEPStatusNotFound

@@ -1,6 +1,6 @@
-#include "providers/memory/TMemoryMethodDecl.h"
+#include "TMemoryMethodDecl.h"
 
-#include "providers/memory/CIMTypes.h"
+#include "CIMTypes.h"
 
 namespace NQRVZEP20 {
 

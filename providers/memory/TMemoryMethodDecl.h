@@ -1,8 +1,8 @@
 #pragma once
 
 #include "ICIMMethodDecl.h"
-#include "providers/memory/TMemoryNamedElement.h"
-#include "providers/memory/TMemoryParameterDecl.h"
+#include "TMemoryNamedElement.h"
+#include "TMemoryParameterDecl.h"
 
 namespace NQRVZEP20 {
 

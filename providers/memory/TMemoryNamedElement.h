@@ -1,9 +1,9 @@
 #pragma once
 
 #include "ICIMNamespace.h"
+#include "TMemoryQualifier.h"
+#include "TNamedList.h"
 #include "TZEPException.h"
-#include "providers/memory/TMemoryQualifier.h"
-#include "providers/memory/TNamedList.h"
 
 #include <boost/enable_shared_from_this.hpp>
 #include <boost/make_shared.hpp>
@@ -27,7 +27,6 @@ public:
     VisitEach(fQualifiers.Elements(), callback);
   }
 
-  // Throws kZEPStatusNotFound when the declaration is not one of this element's namespace.
   boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                 unsigned int flavor, TCIMContext const& context) override {
     const std::string name = declaration->GetName(context);

@@ -1,11 +1,11 @@
-#include "providers/memory/TMemoryNamespace.h"
+#include "TMemoryNamespace.h"
 
+#include "CIMTypes.h"
+#include "FillLog.h"
+#include "StandardQualifiers.h"
+#include "TMemoryClass.h"
+#include "TMemoryQualifierDecl.h"
 #include "TZEPException.h"
-#include "providers/memory/CIMTypes.h"
-#include "providers/memory/FillLog.h"
-#include "providers/memory/StandardQualifiers.h"
-#include "providers/memory/TMemoryClass.h"
-#include "providers/memory/TMemoryQualifierDecl.h"
 
 #include <boost/make_shared.hpp>
 

@@ -1,9 +1,9 @@
 #pragma once
 
 #include "ICIMNamespace.h"
-#include "providers/memory/TMemoryClassBuilder.h"
-#include "providers/memory/TMemoryInstance.h"
-#include "providers/memory/TNamedList.h"
+#include "TMemoryClassBuilder.h"
+#include "TMemoryInstance.h"
+#include "TNamedList.h"
 
 #include <boost/enable_shared_from_this.hpp>
 
@@ -22,9 +22,10 @@ class TMemoryQualifierDecl;
 //   ns->DefineClass("X_Disk", "X_Device").Property("Name", "string").Property("Sizes", "uint64[4]");
 //   ns->AddInstance("X_Disk", {{"Id", 5}, {"Name", "sda"}});
 //
-// Always held by boost::shared_ptr. It owns everything in it and lets go of everything when it goes; what someone still
-// holds then keeps its name and its own values, but finds no namespace, class or superclass any more
-// (boost::bad_weak_ptr). Lookups by name and by object path take constant time. Contexts are ignored.
+// Always held by boost::shared_ptr. It owns everything in it and lets go of everything when it goes: a class that someone
+// still holds then is empty, an instance keeps its values but for references, and what looks for the namespace, or for a
+// class that nobody holds, throws boost::bad_weak_ptr. Lookups by name and by object path take constant time. Contexts are
+// ignored. Several threads may read at once while none writes.
 class TMemoryNamespace : public ICIMNamespace, public boost::enable_shared_from_this<TMemoryNamespace> {
 public:
   // Empty: without classes and without qualifier declarations.

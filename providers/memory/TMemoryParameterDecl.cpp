@@ -1,4 +1,4 @@
-#include "providers/memory/TMemoryParameterDecl.h"
+#include "TMemoryParameterDecl.h"
 
 #include "ICIMMethodDecl.h"
 

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "ICIMParameterDecl.h"
-#include "providers/memory/TMemoryNamedElement.h"
+#include "TMemoryNamedElement.h"
 
 namespace NQRVZEP20 {
 

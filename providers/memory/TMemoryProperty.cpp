@@ -1,5 +1,6 @@
-#include "providers/memory/TMemoryProperty.h"
+#include "TMemoryProperty.h"
 
+#include "CIMTypes.h"
 #include "ICIMPropertyDecl.h"
 #include "TZEPException.h"
 
@@ -20,6 +21,11 @@ void TMemoryProperty::SetValue(TCIMValue const& value, TCIMContext const&) {
   TCIMValue copy(value);
   fValue.SetNullValue(TCIMValue::TCIMType::kCIMTypeInvalid, 0);
   fValue = std::move(copy);
+}
+
+void TMemoryProperty::DropReference() {
+  const TCIMValue::TCIMType type = fValue.GetType();
+  if (BaseTypeOf(type) == TCIMValue::TCIMType::kCIMTypeReference) fValue.SetNullValue(type, fValue.GetMaxArraySize());
 }
 
 std::string TMemoryProperty::GetName(TCIMContext const& context) const { return fDeclaration->GetName(context); }

@@ -19,6 +19,9 @@ public:
   // From now on SetValue throws kZEPStatusInvalidOpSequence: the value is a key by which the instance is filed.
   void Fix() { fIsFixed = true; }
 
+  // Makes a reference, or an array of references, NULL.
+  void DropReference();
+
 private:
   boost::shared_ptr<ICIMPropertyDecl const> fDeclaration;
   TCIMValue fValue;  // always of the declared type

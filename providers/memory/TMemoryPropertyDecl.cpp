@@ -1,6 +1,6 @@
-#include "providers/memory/TMemoryPropertyDecl.h"
+#include "TMemoryPropertyDecl.h"
 
-#include "providers/memory/TMemoryClass.h"
+#include "TMemoryClass.h"
 
 namespace NQRVZEP20 {
 

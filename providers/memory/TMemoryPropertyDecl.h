@@ -1,7 +1,7 @@
 #pragma once
 
 #include "ICIMPropertyDecl.h"
-#include "providers/memory/TMemoryNamedElement.h"
+#include "TMemoryNamedElement.h"
 
 namespace NQRVZEP20 {
 
@@ -18,7 +18,6 @@ public:
   bool IsKey(TCIMContext const& context) const override;
   boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const override;
 
-  // The qualifier Key throws kZEPStatusInvalidOpSequence once the class or a subclass has made an instance.
   boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                 unsigned int flavor, TCIMContext const& context) override;
 

@@ -1,6 +1,6 @@
-#include "providers/memory/TMemoryProvider.h"
+#include "TMemoryProvider.h"
 
-#include "providers/memory/TMemoryNamespace.h"
+#include "TMemoryNamespace.h"
 
 #include <boost/make_shared.hpp>
 

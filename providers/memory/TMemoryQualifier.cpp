@@ -1,4 +1,4 @@
-#include "providers/memory/TMemoryQualifier.h"
+#include "TMemoryQualifier.h"
 
 #include "ICIMNamedElement.h"
 

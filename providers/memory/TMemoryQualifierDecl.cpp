@@ -1,4 +1,4 @@
-#include "providers/memory/TMemoryQualifierDecl.h"
+#include "TMemoryQualifierDecl.h"
 
 namespace NQRVZEP20 {
 

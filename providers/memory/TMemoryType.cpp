@@ -1,6 +1,6 @@
-#include "providers/memory/TMemoryType.h"
+#include "TMemoryType.h"
 
-#include "providers/memory/CIMTypes.h"
+#include "CIMTypes.h"
 
 #include <charconv>
 #include <optional>

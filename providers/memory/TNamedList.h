@@ -1,6 +1,6 @@
 #pragma once
 
-#include "providers/memory/CIMNames.h"
+#include "CIMNames.h"
 
 #include <boost/shared_ptr.hpp>
 

@@ -7,6 +7,8 @@
 
 #include <gtest/gtest.h>
 
+#include <locale>
+
 namespace NQRVZEP20 {
 namespace {
 
@@ -42,6 +44,17 @@ TEST(AssertionHandlerTest, ThrowsFailInModeThrowzep) {
 
 TEST(AssertionHandlerTest, ThrowboostCarriesTheWholeMessage) {
   EXPECT_EQ(MessageOf("px != 0", "void f()", "a.cpp", 7), "Boost assertion failure! a.cpp:7 [px != 0] func = void f()");
+}
+
+TEST(AssertionHandlerTest, TheLineNumberIsDecimalInEveryLocale) {
+  struct TGrouping : std::numpunct<char> {
+    char do_thousands_sep() const override { return ','; }
+    std::string do_grouping() const override { return "\3"; }
+  };
+  std::locale const old = std::locale::global(std::locale(std::locale::classic(), new TGrouping));
+  std::string const message = MessageOf("px != 0", "f", "a.cpp", 1234567);
+  std::locale::global(old);
+  EXPECT_EQ(message, "Boost assertion failure! a.cpp:1234567 [px != 0] func = f");
 }
 
 TEST(AssertionHandlerTest, ANullPieceDropsTheRestOfTheMessage) {

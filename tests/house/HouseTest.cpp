@@ -8,6 +8,7 @@
 #include <cstdio>
 #include <map>
 #include <memory>
+#include <regex>
 #include <set>
 
 namespace NQRVZEP20 {
@@ -91,6 +92,35 @@ TEST(HouseTest, EveryPublicHeaderIsInTheOneThatIncludesThemAll) {
     std::string const name = header.filename().string();
     EXPECT_TRUE(name == "zepcore.h" || all.count(name)) << header;
   }
+}
+
+// Every test of the tree, as "Suite.Name".
+std::set<std::string> AllTests() {
+  static std::regex const test(R"(^(?:TYPED_)?TEST(?:_F|_P)?\((\w+), (\w+)\))");
+  std::set<std::string> tests;
+  for (auto const& entry : fs::recursive_directory_iterator(kSource / "tests")) {
+    if (entry.path().extension() != ".cpp") continue;
+    std::ifstream file(entry.path());
+    std::smatch match;
+    for (std::string line; std::getline(file, line);)
+      if (std::regex_search(line, match, test)) tests.insert(match[1].str() + "." + match[2].str());
+  }
+  return tests;
+}
+
+TEST(HouseTest, EveryKeptBehaviourNamesAFileAndATestThatExist) {
+  static std::regex const row(R"(^\| .* \| `([^`]+)` \| `([^`]+)` \|$)");
+  std::set<std::string> const tests = AllTests();
+  std::istringstream lines(ReadFile((kSource / "docs/kept-behaviour.md").string()));
+  int rows = 0;
+  std::smatch match;
+  for (std::string line; std::getline(lines, line);) {
+    if (!std::regex_match(line, match, row)) continue;
+    EXPECT_TRUE(fs::exists(kSource / match[1].str())) << match[1];
+    EXPECT_TRUE(tests.count(match[2])) << match[2];
+    ++rows;
+  }
+  EXPECT_GT(rows, 20);
 }
 
 std::string OutputOf(std::string const& command) {

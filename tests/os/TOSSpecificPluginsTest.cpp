@@ -206,6 +206,7 @@ TEST_F(RootPathTest, IsWhatTheDynamicLinkerCallsIt) {
   fs::create_symlink("../libzepcore.so", fDir.Path("link/libzepcore.so"));
   EXPECT_THAT(Probe(fDir.Path("link"), "root"), ElementsAre(fDir.Path("link")));
   EXPECT_EQ(RunProgram("cd " + fDir.Path() + " && LD_LIBRARY_PATH=. " + kProbe + " root").output, ".\n");
+  EXPECT_EQ(RunProgram("cd " + fDir.Path() + " && LD_LIBRARY_PATH=:/nowhere " + kProbe + " root").output, ".\n");
 }
 
 TEST_F(RootPathTest, ALibraryNameOfUpTo511BytesIsTaken) {

@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
 # Installs the build tree given into a fresh prefix and uses it there as a stranger would: runs zep, and builds the consumer
-# with CMake and with pkg-config.
+# with CMake and with pkg-config, and a provider plug-in with CMake.
 #
 #   install-test.sh BUILD_DIR CXX
 set -euo pipefail
@@ -27,7 +27,7 @@ check() {  # check NAME PROGRAM
   [[ $printed == "$expected" ]] || { printf '%s printed:\n%s\ninstead of:\n%s\n' "$1" "$printed" "$expected" >&2; exit 1; }
 }
 
-cmake -S "$here/consumer" -B "$work/cmake" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/cmake.log"
+cmake -G Ninja -S "$here/consumer" -B "$work/cmake" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/cmake.log"
 cmake --build "$work/cmake" >>"$work/cmake.log" || { cat "$work/cmake.log" >&2; exit 1; }
 check "the consumer built with CMake" "$work/cmake/consumer"
 
@@ -37,4 +37,11 @@ PKG_CONFIG_PATH=$(dirname "$(find "$work/prefix" -name zepcore.pc)")
 read -ra flags <<<"$(pkg-config --define-variable=prefix="$work/prefix" --cflags --libs zepcore)"
 "$cxx" -std=c++17 "$here/consumer/main.cpp" -o "$work/consumer" "${flags[@]}"
 check "the consumer built with pkg-config" "$work/consumer"
+
+# A provider plug-in of somebody else's, as docs/writing-a-provider.md builds it.
+cmake -S "$here/../../examples/Clock" -B "$work/clock" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/clock.log"
+cmake --build "$work/clock" >>"$work/clock.log" || { cat "$work/clock.log" >&2; exit 1; }
+cp "$work/clock/libClock.nsp.so" "$private/"
+"$work/prefix/bin/zep" report --sample >"$work/report" || true  # a machine that tells little is no failure here
+grep -q 'Clock .*root/clock' "$work/report" || { echo "zep does not list the clock plug-in:" >&2; cat "$work/report" >&2; exit 1; }
 echo "the installed tree works"

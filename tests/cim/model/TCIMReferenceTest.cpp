@@ -2,6 +2,7 @@
 
 #include "Fakes.h"
 #include "TCIMReferenceImpl.h"
+#include "providers/memory/TMemoryNamespace.h"
 #include "tests/Support.h"
 
 #include <map>
@@ -375,10 +376,28 @@ TEST_F(TCIMReferenceTest, ANestedPathMayEndTheTextWithoutItsClosingQuote) {
   EXPECT_EQ(KeysOf(Parsed("ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\"")), TNames({"Disk=X_Disk.Id=\"5\""}));
 }
 
+TEST_F(TCIMReferenceTest, ReferencesAreNestedAtMost100Deep) {
+  auto const nested = [](int depth) {
+    std::string path;
+    for (int i = 0; i < depth; ++i) path += "ns:X_Link.Disk=\"";
+    return path + "ns:X_Link.Port=\"1\"" + std::string(static_cast<std::size_t>(depth), '"');
+  };
+  TCIMReference deepest = Empty();
+  deepest.SetPath(nested(100));
+  for (int depth : {101, 100000}) {
+    SCOPED_TRACE(depth);
+    TLogCapture log;
+    TCIMReference tooDeep = Empty();
+    EXPECT_STATUS(tooDeep.SetPath(nested(depth)), kZEPStatusInvalidReference);
+    EXPECT_EQ(log.Entries(), std::vector<std::string>{"[Error] Reference nested too deeply, path=" + nested(depth)});
+  }
+}
+
 TEST_F(TCIMReferenceTest, FailuresInANestedPathNameTheWholePathOnce) {
   struct {
     char const* path;
     char const* message;
+    char const* left = "X_Link";  // a key is set when its value is complete
   } const kRows[] = {
       {"ns:X_Link.Disk=ns:X_Disk", "Reference missing opening '\"', path=ns:X_Link.Disk=ns:X_Disk"},
       {"ns:X_Link.Disk=\"", "Reference specifies invalid class, path=ns:X_Link.Disk=\""},
@@ -386,7 +405,8 @@ TEST_F(TCIMReferenceTest, FailuresInANestedPathNameTheWholePathOnce) {
       {"ns:X_Link.Disk=\"ns:X_Disk.Port=\"5\"\"",
        "Reference specifies invalid property, property=Port, path=ns:X_Link.Disk=\"ns:X_Disk.Port=\"5\"\""},
       {"ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\"x\"", "Reference missing '.' or ',', path=ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\"x\""},
-      {"ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\"\"x", "Reference missing '.' or ',', path=ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\"\"x"},
+      {"ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\"\"x", "Reference missing '.' or ',', path=ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\"\"x",
+       "X_Link.Disk=\"X_Disk.Id=\"5\"\""},
       {"ns:X_Link.Disk=\"ns:X_Disk.\"", "Reference missing property value, path=ns:X_Link.Disk=\"ns:X_Disk.\""},
       {"ns:X_Link.Disk=\"ns:X_Disk.Id=\"5", "Reference missing closing '\"', path=ns:X_Link.Disk=\"ns:X_Disk.Id=\"5"},
   };
@@ -396,7 +416,7 @@ TEST_F(TCIMReferenceTest, FailuresInANestedPathNameTheWholePathOnce) {
     TCIMReference link = Empty();
     EXPECT_STATUS(link.SetPath(row.path), kZEPStatusInvalidReference);
     EXPECT_EQ(log.Entries(), TNames({std::string("[Error] ") + row.message}));
-    EXPECT_EQ(link.GetPath(), "X_Link");  // the key whose value failed is not set
+    EXPECT_EQ(link.GetPath(), row.left);
   }
 }
 
@@ -923,6 +943,62 @@ TEST_F(TCIMReferenceTest, AReferenceIsReadFromTheTextOfAValue) {
   TCIMValue const value(ECIMType::kCIMTypeReference, text, ns_);
   EXPECT_EQ(value.ToString(10), "X_Disk.Id=\"5\"");
   EXPECT_EQ(value.GetReferencedClass(), ns_->Class("X_Disk"));
+}
+
+// ---- Against a namespace in memory ----
+
+class TCIMReferenceInMemoryTest : public testing::Test {
+protected:
+  TCIMReferenceInMemoryTest() {
+    ns_->DefineClass("X_Disk").Key("Id", "uint32").Key("Name", "string").Property("Size", "uint64");
+    ns_->DefineClass("X_Link").Association().KeyReference("Disk", "X_Disk").Key("Port", "uint8");
+  }
+
+  TCIMReference Parsed(std::string const& path) const { return TCIMReference(ns_, path, TCIMContext()); }
+
+  boost::shared_ptr<TMemoryNamespace> const ns_ = boost::make_shared<TMemoryNamespace>("root/storage");
+};
+
+TEST_F(TCIMReferenceInMemoryTest, APathLeadsToItsInstance) {
+  auto const sda = ns_->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "s\"d\\a"}});
+  auto const sdb = ns_->AddInstance("X_Disk", {{"Id", 6u}, {"Name", "sdb"}});
+  EXPECT_EQ(Parsed("ns:X_Disk.Id=\"5\",Name=\"s\\\"d\\\\a\"").GetCIMElement(false), sda);
+  EXPECT_EQ(Parsed("ns:X_Disk.Name=\"sdb\",Id=\"6\"").GetCIMElement(false), sdb);
+  EXPECT_STATUS(Parsed("ns:X_Disk.Name=\"sdb\",Id=\"7\"").GetCIMElement(false), kZEPStatusNotFound);
+  EXPECT_STATUS(Parsed("ns:X_Disk.Id=\"6\"").GetCIMElement(false), kZEPStatusNotFound);
+}
+
+TEST_F(TCIMReferenceInMemoryTest, ThePathOfAnInstanceLeadsBackToIt) {
+  auto const disk = ns_->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "a\",\\b=c.d:e"}});
+  TCIMReference const path = disk->GetPath(TCIMContext());
+  EXPECT_EQ(path.GetCIMElement(false), disk);
+  EXPECT_TRUE(Parsed("ns:" + path.GetPath()) == path);
+  EXPECT_EQ(Parsed("ns:" + path.GetPath()).GetCIMElement(false), disk);
+}
+
+TEST_F(TCIMReferenceInMemoryTest, AReferenceKeyLeadsToItsInstance) {
+  auto const disk = ns_->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "sda"}});
+  auto const link = ns_->AddInstance("X_Link", {{"Disk", disk->GetReference()}, {"Port", 1}});
+  TCIMReference const path = Parsed("ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\",Name=\"sda\"\",Port=\"1\"");
+  EXPECT_EQ(path.GetCIMElement(false), link);
+  EXPECT_EQ(path.GetPath(), "X_Link.Disk=\"X_Disk.Id=\"5\",Name=\"sda\"\",Port=\"1\"");
+}
+
+TEST_F(TCIMReferenceInMemoryTest, UnknownNamesAreInvalid) {
+  for (std::string const path : {"ns:X_Tape", "ns:X_Disk.Serial=\"5\"", "ns:X_Link.Disk=\"ns:X_Tape.Id=\"5\"\""}) {
+    SCOPED_TRACE(path);
+    EXPECT_STATUS(Parsed(path), kZEPStatusInvalidReference);
+  }
+}
+
+// A class that is still being described answers unknown names with an empty pointer.
+TEST_F(TCIMReferenceInMemoryTest, UnknownNamesAreInvalidAlsoWhileTheClassIsDescribed) {
+  auto const cls = ns_->GetClass("X_Disk", TCIMContext());
+  cls->BeginDeclarations(TCIMContext());
+  EXPECT_STATUS(Parsed("ns:X_Disk.Serial=\"5\""), kZEPStatusInvalidReference);
+  TCIMReference disk(ns_, TCIMContext());
+  disk.SetClass(cls);
+  EXPECT_STATUS(disk.AddKeyValue("Serial", TCIMValue(5u)), kZEPStatusNotFound);
 }
 
 }  // namespace

@@ -1,6 +1,7 @@
 #include "TCIMSchemaHelper.h"
 
 #include "Fakes.h"
+#include "providers/memory/TMemoryNamespace.h"
 #include "tests/Support.h"
 
 #include <functional>
@@ -569,6 +570,14 @@ TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberMayBeANumber) {
   EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "20000000000");
 }
 
+TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberOfAnotherTypeIsPassedOver) {
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue("12345"));
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", Strings({"23456"}));
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue(TCIMChar16(std::string("x"))));
+  Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue(TCIMDateTime()));
+  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "12345");
+}
+
 TEST_F(TCIMSchemaHelperEsxiTest, WithoutChassisTheSerialNumberIsNotFound) {
   EXPECT_STATUS(SerialNumber(), kZEPStatusNotFound);
   Add("OMC_UnitaryComputerSystem", "OtherIdentifyingInfo", Strings({"SN:KQ1234A"}));
@@ -606,22 +615,24 @@ TEST_F(TCIMSchemaHelperEsxiTest, APlaceholderGivesWayToTheOtherIdentifyingInfo) 
 TEST_F(TCIMSchemaHelperEsxiTest, TheOtherIdentifyingInfoIsTheTextBehindTheColonOfTheFirstEntryWithOne) {
   TCIMValue const withNull(ECIMType::kCIMTypeString, 0, {NullOf(ECIMType::kCIMTypeString), TCIMValue("SN:A")});
   struct {
+    char const* what;
     TCIMValue info;
     char const* result;
   } const kRows[] = {
-      {Strings({"a:b:c", "d:e"}), "b:c"},
-      {Strings({"SN: KQ1234A "}), " KQ1234A "},
-      {Strings({"SN:"}), ""},
-      {Strings({"a", "b"}), "Unknown"},
-      {Strings({}), "Unknown"},
-      {withNull, "A"},
-      {TCIMValue("SN:A"), "Unknown"},
-      {TCIMValue(5u), "Unknown"},
-      {NullOf(ECIMType::kCIMTypeString), "Unknown"},
-      {TCIMValue(ECIMType::kCIMTypeUint32, 0, {TCIMValue(5u)}), "Unknown"},
+      {"two with a colon", Strings({"a:b:c", "d:e"}), "b:c"},
+      {"blanks", Strings({"SN: KQ1234A "}), " KQ1234A "},
+      {"nothing behind the colon", Strings({"SN:"}), ""},
+      {"no colon", Strings({"a", "b"}), "Unknown"},
+      {"no entry", Strings({}), "Unknown"},
+      {"a NULL entry", withNull, "A"},
+      {"no array", TCIMValue("SN:A"), "Unknown"},
+      {"a number", TCIMValue(5u), "Unknown"},
+      {"numbers", TCIMValue(ECIMType::kCIMTypeUint32, 0, {TCIMValue(5u)}), "Unknown"},
+      {"NULL", NullOf(ECIMType::kCIMTypeString), "Unknown"},
+      {"a NULL array", TCIMValue(ECIMType::kCIMTypeString, 4), "Unknown"},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.info.IsNull() ? "NULL" : row.info.ToString(10).substr(0, 20));
+    SCOPED_TRACE(row.what);
     auto const ns = boost::make_shared<TFakeNamespace>();
     ns->Add("OMC_Chassis").AddInstance()->Add("SerialNumber", TCIMValue("none"));
     ns->Add("OMC_UnitaryComputerSystem").AddInstance()->Add("OtherIdentifyingInfo", row.info);
@@ -657,6 +668,42 @@ TEST_F(TCIMSchemaHelperEsxiTest, LogsNothingAndCarriesTheProviderToAsk) {
   EXPECT_EQ(ns_->fCalls.fNames,
             TNames({"CIM_PhysicalElement", "CIM_PhysicalElement", "VMware_HypervisorSoftwareIdentity", "OMC_Chassis"}));
   EXPECT_EQ(ns_->fCalls.fContexts, std::vector<TCIMContext>(4, TCIMContext{{"nspID", TCIMValue("plugin")}}));
+}
+
+// ---- Against a namespace in memory ----
+
+TEST(TCIMSchemaHelperInMemoryTest, AnswersForAFilledNamespace) {
+  auto const ns = boost::make_shared<TMemoryNamespace>("root/cimv2");
+  ns->DefineClass("QRVSG_ComputerSystem")
+      .Key("Name", "string")
+      .Property("ProductName", "string")
+      .Property("SerialNumber", "string");
+  ns->DefineClass("QRVSG_OperatingSystem").Key("Name", "string").Property("Version", "string").Property("OSType", "string");
+  ns->DefineClass("QRVSG_ZEPProduct").Key("Version", "string").Property("Build", "string");
+  auto const system = ns->AddInstance(
+      "QRVSG_ComputerSystem", {{"Name", "host17"}, {"ProductName", "Server X1-[1234ABC]-"}, {"SerialNumber", "KQ1234A "}});
+  ns->AddInstance("QRVSG_OperatingSystem", {{"Name", "Debian"}, {"Version", "12"}, {"OSType", "LINUX"}});
+  ns->AddInstance("QRVSG_ZEPProduct", {{"Version", "3.20.5"}, {"Build", "ZP305"}});
+
+  using THelper = TCIMSchemaHelper;
+  EXPECT_EQ(THelper::GetSystemProductName(ns), "Server X1-[1234ABC]-");
+  EXPECT_EQ(THelper::GetSystemName(ns), "host17");
+  EXPECT_EQ(THelper::GetOperatingSystemName(ns), "Debian");
+  EXPECT_EQ(THelper::GetOperatingSystemVersion(ns), "12");
+  EXPECT_EQ(THelper::GetOperatingSystemType(ns), "LINUX");
+  EXPECT_EQ(THelper::GetMTM(ns), "1234ABC");
+  EXPECT_EQ(THelper::GetMachineType(ns), "1234");
+  EXPECT_EQ(THelper::GetModelNumber(ns), "ABC");
+  EXPECT_EQ(THelper::GetSerialNumber(ns, TCIMContext()), "KQ1234A");
+  EXPECT_EQ(THelper::GetDataSourceVersion(ns, TCIMContext()), "3.20.5");
+  EXPECT_EQ(THelper::GetDataSourceBuild(ns, TCIMContext()), "ZP305");
+  EXPECT_EQ(THelper::GetDataSourceMajorVersion(ns, TCIMContext()), "3");
+  EXPECT_EQ(THelper::GetDataSourceMinorVersion(ns, TCIMContext()), "20");
+  EXPECT_EQ(THelper::GetDataSourceBuildVersion(ns), "5");
+
+  system->Set("ProductName", TCIMValue());
+  EXPECT_STATUS(THelper::GetMTM(ns), kZEPStatusNotFound);
+  EXPECT_STATUS(THelper::GetSystemProductName(ns), kZEPStatusValueIsNULL);
 }
 
 }  // namespace

@@ -28,7 +28,7 @@ class TCIMNumericConversionTest : public testing::Test {};
 
 using TNumbers = testing::Types<bool, unsigned char, signed char, unsigned short, short, unsigned int, int, unsigned long, long,
                                 float, double>;
-TYPED_TEST_SUITE(TCIMNumericConversionTest, TNumbers);
+TYPED_TEST_SUITE(TCIMNumericConversionTest, TNumbers, );
 
 // Reads the data as TAsked: its value when it is stored as exactly that, else a type mismatch.
 template <class TAsked, class TStored, class TData>

@@ -160,7 +160,8 @@ TNumber Extracted(std::string const& text) {
   std::istringstream stream(text);
   stream.imbue(std::locale::classic());
   TNumber number{};
-  return stream >> std::boolalpha >> number ? number : TNumber{};
+  stream >> std::boolalpha >> number;
+  return stream ? number : TNumber{};
 }
 
 // Compares the bits, so that 0 and -0 are told apart.

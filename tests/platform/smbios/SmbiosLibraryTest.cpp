@@ -10,8 +10,10 @@
 #include <sys/stat.h>
 #include <sys/wait.h>
 
+#include <atomic>
+#include <chrono>
 #include <cstring>
-#include <numeric>
+#include <thread>
 
 namespace NQRVZEP20 {
 namespace {
@@ -199,6 +201,39 @@ TEST_F(SmbiosLibraryTest, TheVariableIsLookedAtByEachLoad) {
   THandle const second = Open(Structure(1, "second"));
   EXPECT_EQ(First(first, 1), Whole(Structure(1, "first"))) << "a handle keeps its own copy";
   EXPECT_EQ(First(second, 1), Whole(Structure(1, "second")));
+}
+
+// The library keeps the file that it read last, once that has been left alone for a while.
+TEST_F(SmbiosLibraryTest, AChangedFileIsReadAgain) {
+  EXPECT_EQ(First(Open(Structure(1, "one")), 1), Whole(Structure(1, "one")));
+  EXPECT_EQ(First(Open(Structure(1, "two")), 1), Whole(Structure(1, "two"))) << "changed at once, same size";
+
+  std::this_thread::sleep_for(std::chrono::milliseconds(2100));
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", dir_.Path("table").c_str());
+  for (int time = 0; time < 3; ++time) {
+    void* handle = nullptr;
+    ASSERT_EQ(load_(nullptr, &handle), kSmbiosOk);
+    EXPECT_EQ(First(THandle(handle, close_), 1), Whole(Structure(1, "two"))) << "left alone";
+  }
+  EXPECT_EQ(First(Open(Structure(1, "six")), 1), Whole(Structure(1, "six"))) << "changed after it was kept";
+  std::filesystem::remove(dir_.Path("table"));
+  EXPECT_EQ(LoadStatusOfPath(dir_.Path("table")), kSmbiosFileNotFound);
+}
+
+TEST_F(SmbiosLibraryTest, ThreadsOpenAndReadAtOnce) {
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", RealTablePath("full").c_str());
+  std::string const system = First(Open(RealTable("full")), 1);
+  std::vector<std::thread> threads;
+  std::atomic<int> right{0};
+  for (int thread = 0; thread < 4; ++thread)
+    threads.emplace_back([&] {
+      for (int time = 0; time < 200; ++time) {
+        void* handle = nullptr;
+        if (load_(nullptr, &handle) == kSmbiosOk) right += First(THandle(handle, close_), 1) == system;
+      }
+    });
+  for (std::thread& thread : threads) thread.join();
+  EXPECT_EQ(right, 800);
 }
 
 TEST_F(SmbiosLibraryTest, TheProviderIsNotLookedAt) {

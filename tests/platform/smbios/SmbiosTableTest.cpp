@@ -11,6 +11,7 @@
 #include <cstring>
 #include <memory>
 #include <random>
+#include <regex>
 
 namespace NQRVZEP20 {
 namespace {

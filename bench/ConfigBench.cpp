@@ -1,0 +1,73 @@
+// A configuration file of 100,000 lines beside GLib's GKeyFile: with its keys in order, and in any order.
+
+#include "TConfig.h"
+
+#include <benchmark/benchmark.h>
+#include <glib.h>
+#include <stdlib.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <fstream>
+#include <numeric>
+#include <random>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+namespace {
+
+using NQRVZEP20::TConfig;
+
+constexpr std::size_t kLines = 100000;
+
+// Works in a directory with both files of the same settings: "zep.cfg", and "zep.ini" with a group for GKeyFile.
+class TSettingsDirectory {
+public:
+  explicit TSettingsDirectory(bool inOrder) : fOld(std::filesystem::current_path()) {
+    if (::mkdtemp(fPath) == nullptr) throw std::runtime_error("no temporary directory");
+    std::filesystem::current_path(fPath);
+    std::vector<int> numbers(kLines);
+    std::iota(numbers.begin(), numbers.end(), 100000);
+    if (!inOrder) std::shuffle(numbers.begin(), numbers.end(), std::mt19937(1983));
+    std::ofstream ours("zep.cfg"), theirs("zep.ini");
+    theirs << "[group]\n";
+    for (int const number : numbers)
+      for (std::ofstream* const file : {&ours, &theirs})
+        *file << "collector.setting." << number << "=value of setting " << number << "\n";
+  }
+  ~TSettingsDirectory() {
+    std::filesystem::current_path(fOld);
+    std::filesystem::remove_all(fPath);
+  }
+
+private:
+  std::filesystem::path fOld;
+  char fPath[32] = "/tmp/zep-config-bench.XXXXXX";
+};
+
+void ReadByZep(benchmark::State& state, bool inOrder) {
+  TSettingsDirectory const directory(inOrder);
+  for (auto _ : state) {
+    TConfig config;
+    if (config.getValue("collector.setting.123456").empty()) throw std::runtime_error("settings lost");
+  }
+}
+BENCHMARK_CAPTURE(ReadByZep, InOrder, true)->Name("SettingsInOrder_Zep");
+BENCHMARK_CAPTURE(ReadByZep, InAnyOrder, false)->Name("SettingsInAnyOrder_Zep");
+
+void ReadByGKeyFile(benchmark::State& state, bool inOrder) {
+  TSettingsDirectory const directory(inOrder);
+  for (auto _ : state) {
+    GKeyFile* const file = g_key_file_new();
+    g_key_file_load_from_file(file, "zep.ini", G_KEY_FILE_NONE, nullptr);
+    char* const value = g_key_file_get_value(file, "group", "collector.setting.123456", nullptr);
+    if (value == nullptr) throw std::runtime_error("settings lost");
+    g_free(value);
+    g_key_file_free(file);
+  }
+}
+BENCHMARK_CAPTURE(ReadByGKeyFile, InOrder, true)->Name("SettingsInOrder_GKeyFile");
+BENCHMARK_CAPTURE(ReadByGKeyFile, InAnyOrder, false)->Name("SettingsInAnyOrder_GKeyFile");
+
+}  // namespace

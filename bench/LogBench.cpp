@@ -1,0 +1,76 @@
+// Log entries beside spdlog's: one below the threshold, and one that is written to a file and flushed. Both loggers are
+// reached as callers reach them, through the process's accessor.
+
+#include "TLogger.h"
+#include "TRootObject.h"
+
+#include <benchmark/benchmark.h>
+#include <spdlog/sinks/basic_file_sink.h>
+#include <spdlog/spdlog.h>
+#include <stdlib.h>
+
+#include <filesystem>
+#include <stdexcept>
+#include <string>
+
+namespace {
+
+using NQRVZEP20::ILogger;
+using NQRVZEP20::TLogger;
+using NQRVZEP20::TRootObject;
+
+std::string const kMessage = "TConfig::getValue(): key found, value is /var/log/messages";
+
+class TLogDirectory {
+public:
+  TLogDirectory() {
+    if (::mkdtemp(fPath) == nullptr) throw std::runtime_error("no temporary directory");
+  }
+  ~TLogDirectory() { std::filesystem::remove_all(fPath); }
+  std::string Path(char const* name) const { return std::string(fPath) + "/" + name; }
+
+private:
+  char fPath[32] = "/tmp/zep-log-bench.XXXXXX";
+};
+
+// Both with an open file, from severity Status (info) on.
+class TLoggers {
+public:
+  TLoggers() {
+    TLogger::GetInstance()->SetLogFilename(fDirectory.Path("zep.log"));
+    spdlog::set_default_logger(spdlog::basic_logger_mt("zep", fDirectory.Path("spdlog.log"), true));
+    spdlog::set_level(spdlog::level::info);
+    spdlog::flush_on(spdlog::level::trace);
+  }
+  ~TLoggers() { spdlog::shutdown(); }
+
+private:
+  TLogDirectory fDirectory;
+} const gLoggers;
+
+void FilteredCall_Zep(benchmark::State& state) {
+  for (auto _ : state) TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogDebug, kMessage);
+}
+BENCHMARK(FilteredCall_Zep);
+
+void FilteredCall_spdlog(benchmark::State& state) {
+  for (auto _ : state) spdlog::default_logger_raw()->debug(kMessage);
+}
+BENCHMARK(FilteredCall_spdlog);
+
+// At Debug, so that nothing is recorded in the in-memory list, which spdlog has not.
+void FlushedLine_Zep(benchmark::State& state) {
+  TLogger::SetLogThreshold(ILogger::kLogDebug);
+  for (auto _ : state) TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogDebug, kMessage);
+  TLogger::SetLogThreshold(ILogger::kLogStatus);
+}
+BENCHMARK(FlushedLine_Zep);
+
+void FlushedLine_spdlog(benchmark::State& state) {
+  spdlog::set_level(spdlog::level::debug);
+  for (auto _ : state) spdlog::default_logger_raw()->debug(kMessage);
+  spdlog::set_level(spdlog::level::info);
+}
+BENCHMARK(FlushedLine_spdlog);
+
+}  // namespace

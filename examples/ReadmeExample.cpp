@@ -1,0 +1,18 @@
+// Asks the host provider for the machine type and model of this machine.
+
+#include <zepcore.h>
+
+#include <iostream>
+
+using namespace NQRVZEP20;
+
+int main() {
+  try {
+    TOSSpecific::LoadNSPLibrary("Host");
+    auto const provider = TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Host");
+    std::cout << TCIMSchemaHelper::GetMTM(provider->GetNamespace(TCIMContext())) << "\n";
+  } catch (TZEPException const& failure) {
+    std::cerr << failure.what() << "\n";  // such as kZEPStatusInvalidFormat: the product name tells none
+    return 1;
+  }
+}

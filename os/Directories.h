@@ -1,0 +1,20 @@
+#pragma once
+
+#include "TZEPException.h"
+#include "core/Handles.h"
+
+#include <dirent.h>
+
+#include <string>
+
+namespace NQRVZEP20 {
+
+inline TUniqueDir OpenDirOrThrow(std::string const& path) {
+  TUniqueDir dir(::opendir(path.c_str()));
+  if (!dir) throw TZEPException(kZEPStatusFileSystemError);
+  return dir;
+}
+
+inline bool IsDotOrDotDot(std::string const& name) { return name == "." || name == ".."; }
+
+}  // namespace NQRVZEP20

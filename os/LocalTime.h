@@ -1,0 +1,30 @@
+#pragma once
+
+#include <ctime>
+
+namespace NQRVZEP20 {
+
+// One reading of the wall clock, in local time.
+struct TLocalTime {
+  std::time_t fTime;  // seconds since the epoch
+  std::tm fFields;
+  unsigned int fMilliseconds;  // of the second
+  short fUTCOffset;            // minutes east of UTC: the zone's standard offset, plus 60 while daylight saving is in force
+};
+
+// Reads the wall clock. It looks at TZ when it is made: make one, take the readings that belong together, and let it go.
+class TLocalClock {
+public:
+  TLocalClock();
+
+  // Valid to the next reading on this thread.
+  TLocalTime const& Now();
+
+private:
+  struct TMemory;
+  static thread_local TMemory fgMemory;
+
+  TMemory& fMemory;  // this thread's
+};
+
+}  // namespace NQRVZEP20

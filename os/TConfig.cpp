@@ -1,0 +1,146 @@
+#include "TConfig.h"
+
+#include "TOSSpecific.h"
+#include "TZEPException.h"
+#include "core/Log.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <exception>
+#include <fstream>
+#include <memory>
+#include <string_view>
+
+namespace NQRVZEP20 {
+namespace {
+
+// A file that goes away between the two questions is missing as well.
+bool HasContents(std::string const& path) {
+  try {
+    return TOSSpecific::FileExists(path) && TOSSpecific::GetFileSize(path) != 0;
+  } catch (TZEPException const&) {
+    return false;
+  }
+}
+
+// Every line, with a newline behind it, up to the end of the file or an error.
+std::string LinesOf(std::istream& file) {
+  std::string text;
+  for (std::string line; std::getline(file, line);) text.append(line) += '\n';
+  return text;
+}
+
+// One line of the file. The texts lie in what was read.
+struct TSetting {
+  std::string_view fKey, fValue;
+  std::uint64_t fHead = 0;  // see SortByKey
+};
+
+bool IsComment(std::string_view line) { return !line.empty() && line.front() == '#'; }
+
+std::vector<TSetting> SettingsOf(std::string_view text) {
+  std::vector<TSetting> settings;
+  while (!text.empty()) {
+    std::size_t const end = text.find('\n');
+    std::string_view const line = text.substr(0, end);
+    text.remove_prefix(end + 1);
+    if (IsComment(line)) continue;
+    // Without "=" the value starts where the line does: a bare word maps to itself. Kept.
+    std::size_t const equals = line.find('=');
+    TSetting const setting{line.substr(0, equals), line.substr(equals + 1)};
+    if (!setting.fKey.empty() && !setting.fValue.empty()) settings.push_back(setting);
+  }
+  return settings;
+}
+
+std::size_t LengthOfCommonStart(std::vector<TSetting> const& settings) {
+  if (settings.empty()) return 0;
+  std::string_view common = settings.front().fKey;
+  for (TSetting const& setting : settings) {
+    auto const end = std::mismatch(common.begin(), common.end(), setting.fKey.begin(), setting.fKey.end()).first;
+    common = common.substr(0, static_cast<std::size_t>(end - common.begin()));
+  }
+  return common.size();
+}
+
+// The first eight bytes as a number that orders as they do.
+std::uint64_t HeadOf(std::string_view text) {
+  std::uint64_t head = 0;
+  for (std::size_t i = 0; i < 8; ++i) head = head << 8 | (i < text.size() ? static_cast<unsigned char>(text[i]) : 0u);
+  return head;
+}
+
+// By key, and those of one key in the order of the file. The eight bytes behind the start that all keys share are compared
+// first, as one number: they nearly always decide, and the texts, which lie far apart, are left alone.
+void SortByKey(std::vector<TSetting>& settings) {
+  std::size_t const commonLength = LengthOfCommonStart(settings);
+  for (TSetting& setting : settings) setting.fHead = HeadOf(setting.fKey.substr(commonLength));
+  std::stable_sort(settings.begin(), settings.end(), [](TSetting const& left, TSetting const& right) {
+    return left.fHead != right.fHead ? left.fHead < right.fHead : left.fKey < right.fKey;
+  });
+}
+
+}  // namespace
+
+TConfig* TConfig::cfgInstance = nullptr;
+
+TConfig* TConfig::GetInstance() {
+  if (cfgInstance == nullptr) cfgInstance = std::make_unique<TConfig>().release();  // lives to the end of the process
+  return cfgInstance;
+}
+
+TConfig::TConfig() : fFileName("zep.cfg") { parseConfigFile(); }
+
+TConfig::~TConfig() {
+  // The pointer is not cleared. Kept.
+  if (this != cfgInstance) std::unique_ptr<TConfig>(cfgInstance).reset();
+}
+
+void TConfig::parseConfigFile() {
+  LogDebug("TConfig::parseConfigFile(): start to parse config file");
+  if (fFileName.empty()) return;
+  if (!HasContents(fFileName)) {
+    LogError("TConfig::parseConfigFile(): config file doesn't exist");
+    return;
+  }
+
+  std::ifstream file;
+  try {
+    file.open(fFileName);
+  } catch (std::exception const&) {
+    LogError("TConfig::parseConfigFile(): Open config file ", fFileName, " failed");
+    return;
+  }
+  std::string const text = LinesOf(file);
+  std::vector<TSetting> settings = SettingsOf(text);
+  SortByKey(settings);  // a map takes sorted settings without a search
+  for (TSetting const& setting : settings)
+    fSettings.try_emplace(fSettings.end(), std::string(setting.fKey), setting.fValue);  // the first of one key stays
+}
+
+std::string TConfig::getValue(std::string const& key) {
+  if (fSettings.empty()) {
+    LogError("TConfig::getValue(): map is empty");
+    return "";
+  }
+  auto const setting = fSettings.find(key);
+  if (setting == fSettings.end()) {
+    LogError("TConfig::getValue(): key not found");
+    return "";
+  }
+  LogDebug("TConfig::getValue(): key ", key, " found, value is ", setting->second);
+  return setting->second;
+}
+
+std::vector<std::string> TConfig::listKeys() {
+  if (fSettings.empty()) {
+    LogError("TConfig::getValue(): map is empty");  // names getValue here too. Kept.
+    return {};
+  }
+  std::vector<std::string> keys;
+  keys.reserve(fSettings.size());
+  for (auto const& setting : fSettings) keys.push_back(setting.first);
+  return keys;
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,332 @@
+#include "TOSSpecific.h"
+#include "TZEPException.h"
+#include "core/Handles.h"
+#include "core/Log.h"
+
+#include <fcntl.h>
+#include <signal.h>
+#include <sys/select.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <string_view>
+
+namespace NQRVZEP20 {
+namespace {
+
+constexpr int kCaptureTimeoutSeconds = 300;
+
+// ---- What is run ----
+
+// Strings as exec wants them: an array of pointers to copies, ended by a null pointer.
+class TStringArray {
+public:
+  explicit TStringArray(std::vector<std::string> strings) : fStrings(std::move(strings)) {
+    for (std::string& string : fStrings) fPointers.push_back(string.data());
+    fPointers.push_back(nullptr);
+  }
+  TStringArray(TStringArray const&) = delete;
+  TStringArray& operator=(TStringArray const&) = delete;
+
+  std::vector<std::string> const& Strings() const { return fStrings; }
+  char* const* Data() const { return fPointers.data(); }
+
+private:
+  std::vector<std::string> fStrings;
+  std::vector<char*> fPointers;
+};
+
+std::vector<std::string> FirstAndThen(std::string const& first, std::vector<std::string> const& others) {
+  std::vector<std::string> strings{first};
+  strings.insert(strings.end(), others.begin(), others.end());
+  return strings;
+}
+
+std::string EachWithABlank(std::vector<std::string> const& strings) {
+  std::string text;
+  for (std::string const& string : strings) text.append(string).append(" ");
+  return text;
+}
+
+struct TProgram {
+  std::string const& fPath;
+  TStringArray const& fArguments;
+  TStringArray const* fEnvironment;  // null: the caller's, and the path is searched on PATH
+};
+
+// Returns only when it fails.
+int Exec(TProgram const& program) {
+  if (program.fEnvironment == nullptr) return ::execvp(program.fPath.c_str(), program.fArguments.Data());
+  return ::execve(program.fPath.c_str(), program.fArguments.Data(), program.fEnvironment->Data());
+}
+
+// ---- The pipe ----
+
+struct TPipe {
+  TUniqueFd fReadEnd, fWriteEnd;
+};
+
+// The descriptor, or in its place one above standard error: the child puts its own there and closes the pipe's.
+TUniqueFd AboveStandardError(int fd) {
+  TUniqueFd owner(fd);
+  return fd > STDERR_FILENO ? std::move(owner) : TUniqueFd(::fcntl(fd, F_DUPFD, STDERR_FILENO + 1));
+}
+
+// Without close-on-exec, so that a child that another thread starts meanwhile inherits both ends, and holds this one's
+// output open as long as it lives. Kept.
+TPipe MakePipe() {
+  int ends[2];
+  if (::pipe(ends) != 0) return TPipe();
+  return {AboveStandardError(ends[0]), AboveStandardError(ends[1])};
+}
+
+// ---- The child ----
+
+// Holds back every signal of the thread.
+class TSignalsHeldBack {
+public:
+  TSignalsHeldBack() {
+    sigset_t all;
+    ::sigfillset(&all);
+    ::pthread_sigmask(SIG_SETMASK, &all, &fOldMask);
+  }
+  ~TSignalsHeldBack() { ::pthread_sigmask(SIG_SETMASK, &fOldMask, nullptr); }
+  TSignalsHeldBack(TSignalsHeldBack const&) = delete;
+  TSignalsHeldBack& operator=(TSignalsHeldBack const&) = delete;
+
+  sigset_t const& OldMask() const { return fOldMask; }
+
+private:
+  sigset_t fOldMask;
+};
+
+// What exec would do anyway, done before signals are let through: a handler that ran in the child would change the
+// caller's memory.
+void DropSignalHandlers() {
+  for (int number = 1; number < NSIG; ++number) {
+    struct sigaction action;
+    if (::sigaction(number, nullptr, &action) != 0 || action.sa_handler == SIG_DFL || action.sa_handler == SIG_IGN) continue;
+    action.sa_flags = 0;
+    action.sa_handler = SIG_DFL;
+    ::sigaction(number, &action, nullptr);
+  }
+}
+
+// The child's whole life before exec. It still shares the caller's memory, so nothing is changed, freed or allocated.
+[[noreturn]] void ExecInChild(TProgram const& program, int readEnd, int writeEnd, sigset_t const& signalMask) {
+  ::close(STDOUT_FILENO);
+  ::dup2(writeEnd, STDOUT_FILENO);
+  ::dup2(STDOUT_FILENO, STDERR_FILENO);
+  ::close(readEnd);
+  ::close(writeEnd);
+  DropSignalHandlers();
+  ::pthread_sigmask(SIG_SETMASK, &signalMask, nullptr);
+  ::_exit(Exec(program));  // 255
+}
+
+// vfork lends the child the caller's memory instead of copying its page tables, and holds this thread until the child's
+// exec: a start takes as long in a large process as in a small one.
+pid_t StartChildOrThrow(TProgram const& program, TPipe const& pipe) {
+  TSignalsHeldBack const signals;
+  pid_t const child = ::vfork();
+  if (child == 0) ExecInChild(program, pipe.fReadEnd.get(), pipe.fWriteEnd.get(), signals.OldMask());
+  if (child < 0) {
+    LogError("ERROR: Fork failed");
+    throw TZEPException(kZEPStatusFail);
+  }
+  return child;
+}
+
+// ---- Its output and its end ----
+
+bool CanBeWatched(TUniqueFd const& readEnd) { return readEnd.get() < FD_SETSIZE; }
+
+// As select: above 0 when there is something to read or nothing will come any more, 0 after too long a silence, below 0
+// for a failure, an interruption among them.
+int WaitForOutput(int readEnd, int timeoutSeconds) {
+  fd_set readable;
+  FD_ZERO(&readable);
+  FD_SET(readEnd, &readable);
+  timeval limit{timeoutSeconds, 0};
+  return ::select(FD_SETSIZE, &readable, nullptr, nullptr, timeoutSeconds == -1 ? nullptr : &limit);
+}
+
+constexpr std::size_t kChunkSize = 4095;
+
+// Appends each chunk up to its first zero byte; the rest of a chunk behind one is lost. Kept.
+void AppendChunks(std::string_view text, std::string& output) {
+  for (; !text.empty(); text.remove_prefix(std::min(kChunkSize, text.size()))) {
+    std::string_view const chunk = text.substr(0, kChunkSize);
+    output.append(chunk.substr(0, chunk.find('\0')));
+  }
+}
+
+// Reads to the end of the output; false, with the reason in the log, when that was not reached.
+bool CollectOutput(int readEnd, std::string const& path, int timeoutSeconds, std::string& output) {
+  char buffer[16 * kChunkSize];  // as much as a pipe holds
+  for (;;) {
+    int const ready = WaitForOutput(readEnd, timeoutSeconds);
+    if (ready == 0) {
+      LogDebug("ERROR: SpawnProcess - ", path, " TimeOut!");
+      return false;
+    }
+    if (ready < 0) {
+      LogDebug("ERROR: SpawnProcess - select call failed!");
+      return false;
+    }
+    ssize_t const got = ::read(readEnd, buffer, sizeof buffer);
+    if (got == 0) return true;
+    // A failed read appends nothing and the loop goes on. Kept.
+    if (got > 0) AppendChunks({buffer, static_cast<std::size_t>(got)}, output);
+  }
+}
+
+// 0 for a child that exited with 0, -1 for any other end.
+int ResultOf(pid_t child) {
+  int status = 0;
+  if (::waitpid(child, &status, 0) != child) {
+    LogDebug("ERROR: SpawnProcess - waitpid call failed!");
+    return -1;
+  }
+  if (WTERMSIG(status) != 0) {
+    LogDebug("ERROR: SpawnProcess - Child process exited abnormally!");
+    return -1;
+  }
+  return WEXITSTATUS(status) == 0 ? 0 : -1;
+}
+
+int Run(TProgram const& program, std::string& output, int timeoutSeconds) {
+  TPipe pipe = MakePipe();
+  if (!pipe.fReadEnd || !pipe.fWriteEnd) {
+    LogDebug("ERROR: SpawnProcess - pipe call failed!");
+    return -1;
+  }
+  if (!CanBeWatched(pipe.fReadEnd)) {
+    LogDebug("ERROR: SpawnProcess - select call failed!");
+    return -1;
+  }
+
+  pid_t const child = StartChildOrThrow(program, pipe);
+  pipe.fWriteEnd.reset();
+  // A child whose output was not read to its end is neither ended nor waited for. Kept.
+  if (!CollectOutput(pipe.fReadEnd.get(), program.fPath, timeoutSeconds, output)) return -1;
+  return ResultOf(child);
+}
+
+// The pieces between single blanks, empty ones among them.
+std::vector<std::string> CutAtBlanks(std::string const& text) {
+  std::vector<std::string> pieces;
+  std::size_t start = 0;
+  for (std::size_t blank; (blank = text.find(' ', start)) != std::string::npos; start = blank + 1)
+    pieces.push_back(text.substr(start, blank - start));
+  pieces.push_back(text.substr(start));
+  return pieces;
+}
+
+// ---- Files ----
+
+constexpr std::size_t kReadSize = 4096;
+constexpr std::size_t kLargeReadSize = 128 * 1024;
+
+// Room for a regular file that is larger than one read; what grows meanwhile or lies about its size is read all the same.
+// Devices and most files of /proc and /sys have no size and are read in small pieces.
+std::size_t MakeRoomFor(int fd, std::string& contents) {
+  constexpr off_t kMostRoom = off_t{1} << 32;
+  struct stat status;
+  if (::fstat(fd, &status) != 0 || !S_ISREG(status.st_mode) || status.st_size <= off_t{kReadSize}) return kReadSize;
+  if (status.st_size <= kMostRoom) contents.reserve(static_cast<std::size_t>(status.st_size));
+  return kLargeReadSize;
+}
+
+void RunInShell(std::string const& command) {
+  // What became of the command is for the user to see.
+  [[maybe_unused]] int const ignored = std::system(command.c_str());
+}
+
+}  // namespace
+
+int TOSSpecific::SpawnProcess(std::string const& path, std::vector<std::string> const& args, std::string const& argv0,
+                              std::vector<std::string> const& env, std::string& output, int timeout) {
+  TStringArray const arguments(FirstAndThen(argv0, args));
+  TStringArray const environment(env);
+  if (IsLogged(ILogger::kLogDebug))
+    LogDebug("TOSSpecific::SpawnProcess calling ", path, "\nwith parameters ", EachWithABlank(arguments.Strings()),
+             "\nwith envoirment vars ", EachWithABlank(environment.Strings()));
+  return Run({path, arguments, &environment}, output, timeout);
+}
+
+int TOSSpecific::SpawnProcess(std::string program, std::vector<std::string> args, std::string& output, int timeout) {
+  TStringArray const arguments(FirstAndThen(program, args));
+  LogDebug("SpawnProcess: process ", program);
+  return Run({program, arguments, nullptr}, output, timeout);
+}
+
+std::string TOSSpecific::SpawnProcess(std::string program, std::vector<std::string> args, int timeout) {
+  std::string output;
+  SpawnProcess(std::move(program), std::move(args), output, timeout);
+  return output;
+}
+
+std::string TOSSpecific::SpawnProcess(std::string commandLine, int timeout) {
+  std::vector<std::string> args = CutAtBlanks(commandLine);
+  std::string const program = args.front();
+  args.erase(args.begin());
+  return SpawnProcess(program, args, timeout);
+}
+
+void TOSSpecific::CapFileViaProc(std::string program, std::vector<std::string> args, std::string fileName,
+                                 std::string& contents) {
+  try {
+    SpawnProcess(program, args, kCaptureTimeoutSeconds);
+    contents = CaptureFile(fileName);
+  } catch (std::exception const& failure) {
+    contents.clear();
+    LogError("failed to capture file content due to exception: ", failure.what());
+  }
+}
+
+std::string TOSSpecific::CaptureFile(std::string path) {
+  TUniqueFd const file(::open(path.c_str(), O_RDONLY));
+  if (!file) {
+    LogError("ERROR: CaptureFile failed to open: ", path);
+    throw TZEPException(kZEPStatusFileNotFound);
+  }
+  return GetFileContents(file.get(), path, true);
+}
+
+std::string TOSSpecific::CaptureFileLoader(std::string path, bool logContents) {
+  TUniqueFd const file(::open(path.c_str(), O_RDONLY));
+  if (!file) {
+    LogDebug("CaptureFile failed to open: ", path);
+    LogDebug("Please confirm that the related software/driver is properly installed.");
+    return "";
+  }
+  return GetFileContents(file.get(), path, logContents);
+}
+
+std::string TOSSpecific::GetFileContents(int fd, std::string path, bool logContents) {
+  std::string contents;
+  std::vector<char> buffer(MakeRoomFor(fd, contents));
+  ssize_t got;
+  while ((got = ::read(fd, buffer.data(), buffer.size())) > 0) contents.append(buffer.data(), static_cast<std::size_t>(got));
+  if (got < 0) {
+    LogStatus("GetFileContents failed to read file ", path);
+    throw TZEPException(kZEPStatusFileSystemError);
+  }
+  if (logContents) LogDebug("Debug (linux toss): GetFileContents() Returned: ", contents);
+  return contents;
+}
+
+void TOSSpecific::LaunchTextEditor(std::string path) {
+  char buffer[4096];
+  bool const hasDirectory = ::getcwd(buffer, sizeof buffer) != nullptr;
+  RunInShell("cp " + path + " " + (hasDirectory ? buffer : "/"));
+  // A path of less than 35 characters throws here, after the copy. Kept.
+  std::string const name = path.substr(path.size() - 35);
+  RunInShell((hasDirectory ? "vi *" : "vi /*") + name + "*");
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,65 @@
+#include "HostNamespace.h"
+
+#include "HostRecords.h"
+#include "SmbiosRecords.h"
+#include "TNamespaceWriter.h"
+#include "TSmbiosReader.h"
+#include "providers/memory/TMemoryNamespace.h"
+
+#include <sys/utsname.h>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+utsname Kernel() {
+  utsname kernel = {};
+  ::uname(&kernel);
+  return kernel;
+}
+
+// Writes a class with a record of each structure of that type that `isThere`. `makeRecord` is given a structure and its number.
+template <class TMakeRecord, class TIsThere>
+void WriteEach(TNamespaceWriter& writer, TSmbiosReader const& tables, int type, TIsThere isThere,
+               std::string const& whyNoneIsThere, TMakeRecord makeRecord) {
+  std::vector<TSmbiosStructure> const structures = tables.All(type);
+  std::vector<TRecord> records;
+  for (TSmbiosStructure const& structure : structures)
+    if (isThere(structure)) records.push_back(makeRecord(structure, static_cast<unsigned>(records.size())));
+
+  TMissing const whyNone = structures.empty() ? tables.WhyNone(type) : TMissing{kMissingNotGiven, whyNoneIsThere};
+  writer.Write(makeRecord(TSmbiosStructure(whyNone), 0), records, whyNone);
+}
+
+bool Always(TSmbiosStructure const&) { return true; }
+
+}  // namespace
+
+void FillHostNamespace(TMemoryNamespace& ns) {
+  TNamespaceWriter writer(ns);
+
+  utsname const kernel = Kernel();
+  TSystemName const name = SystemNameOf(kernel);
+  TSmbiosReader const tables;
+  writer.Write(ComputerSystemRecord(tables.First(kSmbiosSystem), tables.SourceOf(kSmbiosSystem), name));
+  writer.Write(OperatingSystemRecord(TOsRelease::OfThisMachine(), kernel, name));
+  writer.Write(ProductRecord());
+
+  WriteEach(writer, tables, kSmbiosBios, Always, "", [&](TSmbiosStructure const& bios, unsigned number) {
+    return BiosRecord(bios, tables.SourceOf(kSmbiosBios), number);
+  });
+  WriteEach(writer, tables, kSmbiosChassis, Always, "", [&](TSmbiosStructure const& chassis, unsigned number) {
+    return ChassisRecord(chassis, tables.SourceOf(kSmbiosChassis), number);
+  });
+  WriteEach(writer, tables, kSmbiosProcessor, IsSocketFilled, "the firmware calls every processor socket empty",
+            [&](TSmbiosStructure const& processor, unsigned number) {
+              return ProcessorRecord(processor, tables.SourceOf(kSmbiosProcessor), number, name);
+            });
+  WriteEach(writer, tables, kSmbiosMemoryDevice, IsSlotFilled, "the firmware calls every memory slot empty",
+            [&](TSmbiosStructure const& memoryDevice, unsigned number) {
+              return MemoryRecord(memoryDevice, tables.SourceOf(kSmbiosMemoryDevice), number);
+            });
+  writer.WriteMissing();
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,118 @@
+#include "Placeholder.h"
+
+#include <algorithm>
+#include <cctype>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+// In lower case.
+constexpr std::string_view kPlaceholders[] = {
+    "to be filled by o.e.m.",
+    "to be filled by o.e.m",
+    "to be filled by oem",
+    "to be filled",
+    "default string",
+    "default",
+    "not specified",
+    "not applicable",
+    "not available",
+    "not present",
+    "not provided",
+    "not settable",
+    "not set",
+    "no information",
+    "unknown",
+    "undefined",
+    "unspecified",
+    "invalid",
+    "none",
+    "null",
+    "n/a",
+    "na",
+    "o.e.m.",
+    "oem",
+    "empty",
+    "<empty>",
+    "[empty]",
+    "system manufacturer",
+    "system product name",
+    "system name",
+    "system version",
+    "system serial number",
+    "system uuid",
+    "system sku",
+    "system sku number",
+    "sku",
+    "sku number",
+    "serial number",
+    "chassis manufacturer",
+    "chassis manufacture",
+    "chassis version",
+    "chassis serial number",
+    "asset tag",
+    "asset-1234567890",
+    "no asset tag",
+    "no asset information",
+    "no dimm",
+    "123456789",
+    "1234567890",
+    "0123456789",
+    "0123456789abcdef",
+    "part number",
+    "03000200-0400-0500-0006-000700080009",
+};
+
+// Followed by the number of the memory slot: "Manufacturer0", "PartNum3".
+constexpr std::string_view kNumberedPlaceholders[] = {
+    "manufacturer",    "partnum",   "sernum",         "assettagnum",       "modulepartnumber",
+    "a1_manufacturer", "a1_sernum", "a1_assettagnum", "array1_partnumber",
+};
+
+constexpr std::string_view kFillers = "0x-.*_#?f";  // a row of four or more of one of these is no value
+constexpr std::size_t kShortestRow = 4;
+
+std::string Lower(std::string_view text) {
+  std::string lower(text);
+  std::transform(lower.begin(), lower.end(), lower.begin(), [](unsigned char c) { return std::tolower(c); });
+  return lower;
+}
+
+std::string_view WithoutOuterBlanks(std::string_view text) {
+  constexpr std::string_view blanks = " \t";
+  std::size_t const first = text.find_first_not_of(blanks);
+  if (first == std::string_view::npos) return {};
+  return text.substr(first, text.find_last_not_of(blanks) - first + 1);
+}
+
+template <std::size_t N>
+bool IsOneOf(std::string_view const (&list)[N], std::string_view text) {
+  return std::find(std::begin(list), std::end(list), text) != std::end(list);
+}
+
+bool IsNumberedPlaceholder(std::string_view text) {
+  std::size_t const digits = text.find_last_not_of("0123456789") + 1;
+  return digits < text.size() && IsOneOf(kNumberedPlaceholders, text.substr(0, digits));
+}
+
+bool IsRowOfFillers(std::string_view text) {
+  return text.size() >= kShortestRow && kFillers.find(text[0]) != std::string_view::npos &&
+         text.find_first_not_of(text[0]) == std::string_view::npos;
+}
+
+}  // namespace
+
+bool IsPlaceholder(std::string_view text) {
+  std::string const lower = Lower(WithoutOuterBlanks(text));
+  return IsOneOf(kPlaceholders, lower) || IsNumberedPlaceholder(lower) || IsRowOfFillers(lower);
+}
+
+TFinding<std::string> WithoutPlaceholder(TFinding<std::string> const& text) {
+  if (!text) return text;
+  if (WithoutOuterBlanks(*text).empty()) return TMissing{kMissingNotGiven, "the firmware gives a blank text"};
+  if (IsPlaceholder(*text)) return TMissing{kMissingPlaceholder, "placeholder text of the firmware: \"" + *text + "\""};
+  return text;
+}
+
+}  // namespace NQRVZEP20

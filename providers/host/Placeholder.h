@@ -1,0 +1,17 @@
+#pragma once
+
+#include "Finding.h"
+
+#include <string>
+#include <string_view>
+
+namespace NQRVZEP20 {
+
+// True for the texts that firmware makers leave in a field that nobody filled: "To Be Filled By O.E.M.", "Default string",
+// "0123456789", a row of one filler character, and the like. Case and surrounding blanks do not matter.
+bool IsPlaceholder(std::string_view text);
+
+// The same finding, but missing where its text is a placeholder or blank.
+TFinding<std::string> WithoutPlaceholder(TFinding<std::string> const& text);
+
+}  // namespace NQRVZEP20

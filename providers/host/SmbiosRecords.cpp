@@ -1,0 +1,396 @@
+#include "SmbiosRecords.h"
+
+#include "Placeholder.h"
+#include "TCIMDateTime.h"
+#include "TZEPException.h"
+
+#include <algorithm>
+#include <cstdio>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+TMissing Unknown() { return {kMissingNotGiven, "the firmware calls it unknown"}; }
+
+TFinding<std::string> TextOf(TSmbiosStructure const& structure, std::size_t offset) {
+  return WithoutPlaceholder(structure.Text(offset));
+}
+
+// The number as a T, unless it is the one that stands for "unknown".
+template <class T, class TNumber>
+TFinding<T> NumberOf(TFinding<TNumber> const& number, TNumber unknown) {
+  if (!number) return number.Why();
+  if (*number == unknown) return Unknown();
+  return static_cast<T>(*number);
+}
+
+bool IsNumber(TFinding<std::uint8_t> const& found, std::uint8_t number) { return found && *found == number; }
+bool IsNumber(TFinding<std::uint16_t> const& found, std::uint16_t number) { return found && *found == number; }
+
+// ---- System ----
+
+bool AreAll(std::vector<unsigned char> const& bytes, unsigned char value) {
+  return std::all_of(bytes.begin(), bytes.end(), [value](unsigned char byte) { return byte == value; });
+}
+
+// The first three fields are little-endian, as all firmware since version 2.6 of the standard (2008) writes them; what is
+// older cannot be told from the structure.
+TFinding<std::string> UuidOf(TSmbiosStructure const& system) {
+  auto const uuid = system.Bytes(0x08, 16);
+  if (!uuid) return uuid.Why();
+  auto const& u = *uuid;
+  if (AreAll(u, 0x00)) return TMissing{kMissingNotGiven, "the firmware gives none (all zeros)"};
+  if (AreAll(u, 0xff)) return TMissing{kMissingNotGiven, "the firmware leaves it to be set (all ones)"};
+  char text[37];
+  std::snprintf(text, sizeof text, "%02X%02X%02X%02X-%02X%02X-%02X%02X-%02X%02X-%02X%02X%02X%02X%02X%02X", u[3], u[2], u[1], u[0],
+                u[5], u[4], u[7], u[6], u[8], u[9], u[10], u[11], u[12], u[13], u[14], u[15]);
+  return WithoutPlaceholder(std::string(text));
+}
+
+// ---- BIOS ----
+
+bool IsDayOfMonth(unsigned day, unsigned month, unsigned year) {
+  constexpr unsigned days[] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+  if (month < 1 || month > 12) return false;
+  bool const leapDay = month == 2 && year % 4 == 0 && (year % 100 != 0 || year % 400 == 0);
+  return day >= 1 && day <= days[month - 1] + (leapDay ? 1 : 0);
+}
+
+// "mm/dd/yyyy"; "mm/dd/yy" is of the 20th century.
+TFinding<TCIMDateTime> DateOf(TFinding<std::string> const& text) {
+  if (!text) return text.Why();
+  TMissing const notADate{kMissingUnexpected, "not in the expected form: \"" + *text + "\" is no date"};
+  std::string shape = *text;
+  for (char& c : shape)
+    if (c >= '0' && c <= '9') c = '9';
+  if (shape != "99/99/9999" && shape != "99/99/99") return notADate;
+
+  unsigned const month = std::stoul(text->substr(0, 2));
+  unsigned const day = std::stoul(text->substr(3, 2));
+  unsigned const year = std::stoul(text->substr(6)) + (shape.size() == 8 ? 1900 : 0);
+  if (!IsDayOfMonth(day, month, year)) return notADate;
+  try {
+    return TCIMDateTime(static_cast<unsigned short>(year), static_cast<unsigned short>(month), day, 0, 0, 0, 0, 0);
+  } catch (TZEPException const&) {
+    return notADate;
+  }
+}
+
+// The segment at which a BIOS of the old kind begins; UEFI firmware gives 0.
+TFinding<std::uint64_t> StartAddressOf(TSmbiosStructure const& bios) {
+  auto const segment = NumberOf<std::uint64_t>(bios.Word(0x06), std::uint16_t(0));
+  if (!segment) return segment.Why();
+  return *segment << 4;
+}
+
+// Such a BIOS ends where the first megabyte ends.
+TFinding<std::uint64_t> EndAddressOf(TSmbiosStructure const& bios) {
+  auto const start = StartAddressOf(bios);
+  if (!start) return start.Why();
+  return std::uint64_t(0xfffff);
+}
+
+// ---- Chassis ----
+
+constexpr char const* kChassisTypes[] = {"Other",
+                                         "Unknown",
+                                         "Desktop",
+                                         "Low Profile Desktop",
+                                         "Pizza Box",
+                                         "Mini Tower",
+                                         "Tower",
+                                         "Portable",
+                                         "Laptop",
+                                         "Notebook",
+                                         "Hand Held",
+                                         "Docking Station",
+                                         "All in One",
+                                         "Sub Notebook",
+                                         "Space-saving",
+                                         "Lunch Box",
+                                         "Main Server Chassis",
+                                         "Expansion Chassis",
+                                         "Sub Chassis",
+                                         "Bus Expansion Chassis",
+                                         "Peripheral Chassis",
+                                         "RAID Chassis",
+                                         "Rack Mount Chassis",
+                                         "Sealed-case PC",
+                                         "Multi-system Chassis",
+                                         "Compact PCI",
+                                         "Advanced TCA",
+                                         "Blade",
+                                         "Blade Enclosure",
+                                         "Tablet",
+                                         "Convertible",
+                                         "Detachable",
+                                         "IoT Gateway",
+                                         "Embedded PC",
+                                         "Mini PC",
+                                         "Stick PC"};  // from 1
+
+constexpr std::uint8_t kChassisTypeOther = 1;
+constexpr std::uint8_t kChassisTypeUnknown = 2;
+constexpr std::uint8_t kChassisTypeBlade = 28;
+constexpr std::uint8_t kChassisTypeBladeEnclosure = 29;
+
+// Without the bit that tells of a lock.
+TFinding<std::uint8_t> ChassisTypeOf(TSmbiosStructure const& chassis) {
+  auto const type = chassis.Byte(0x05);
+  if (!type) return type.Why();
+  std::uint8_t const number = *type & 0x7f;
+  if (number == kChassisTypeUnknown) return Unknown();
+  if (number == 0 || number > std::size(kChassisTypes))
+    return TMissing{kMissingUnexpected, "not in the expected form: chassis type " + std::to_string(number)};
+  return number;
+}
+
+// CIM numbers the types as SMBIOS does, but knows no blade, and an enclosure of blades by the number before.
+TFinding<std::uint16_t> ChassisPackageTypeOf(TSmbiosStructure const& chassis) {
+  auto const type = ChassisTypeOf(chassis);
+  if (!type) return type.Why();
+  if (*type == kChassisTypeBlade) return std::uint16_t(kChassisTypeOther);
+  if (*type == kChassisTypeBladeEnclosure) return std::uint16_t(kChassisTypeBladeEnclosure - 1);
+  return std::uint16_t(*type);
+}
+
+TFinding<std::string> ChassisTypeNameOf(TSmbiosStructure const& chassis) {
+  auto const type = ChassisTypeOf(chassis);
+  if (!type) return type.Why();
+  return std::string(kChassisTypes[*type - 1]);
+}
+
+TFinding<bool> LockOf(TSmbiosStructure const& chassis) {
+  auto const type = chassis.Byte(0x05);
+  if (!type) return type.Why();
+  return (*type & 0x80) != 0;
+}
+
+// Rack units of 1.75 inches, in inches.
+TFinding<float> HeightOf(TSmbiosStructure const& chassis) {
+  auto const units = NumberOf<float>(chassis.Byte(0x11), std::uint8_t(0));
+  if (!units) return units.Why();
+  return *units * 1.75f;
+}
+
+// The number of the SKU text stands behind the list of contained elements, whose size the structure gives.
+TFinding<std::string> ChassisSkuOf(TSmbiosStructure const& chassis) {
+  auto const count = chassis.Byte(0x13);
+  auto const size = chassis.Byte(0x14);
+  if (!count) return count.Why();
+  if (!size) return size.Why();
+  return TextOf(chassis, 0x15 + std::size_t(*count) * *size);
+}
+
+// ---- Processor ----
+
+// The family, or the second family field where the first says so.
+TFinding<std::uint16_t> FamilyOf(TSmbiosStructure const& processor) {
+  constexpr std::uint8_t unknown = 2, seeFamily2 = 0xfe;
+  auto const family = processor.Byte(0x06);
+  if (IsNumber(family, seeFamily2)) return processor.Word(0x28);
+  return NumberOf<std::uint16_t>(family, unknown);
+}
+
+TFinding<std::string> RoleOf(TSmbiosStructure const& processor) {
+  constexpr char const* roles[] = {"Other", "Unknown", "Central Processor", "Math Processor", "DSP Processor", "Video Processor"};
+  auto const type = NumberOf<std::uint8_t>(processor.Byte(0x05), std::uint8_t(2));
+  if (!type) return type.Why();
+  if (*type == 0 || *type > std::size(roles))
+    return TMissing{kMissingUnexpected, "not in the expected form: processor type " + std::to_string(*type)};
+  return std::string(roles[*type - 1]);
+}
+
+// CIM numbers sockets as SMBIOS does, up to the last that it knows.
+TFinding<std::uint16_t> UpgradeMethodOf(TSmbiosStructure const& processor) {
+  constexpr std::uint16_t other = 1, last = 56;
+  auto const method = NumberOf<std::uint16_t>(processor.Byte(0x19), std::uint8_t(2));
+  if (!method) return method.Why();
+  return *method > last ? other : *method;
+}
+
+TFinding<std::uint16_t> CpuStatusOf(TSmbiosStructure const& processor) {
+  auto const status = processor.Byte(0x18);
+  if (!status) return status.Why();
+  std::uint16_t const number = *status & 0x07;
+  if (number == 0) return Unknown();
+  return number;
+}
+
+TFinding<std::uint16_t> DataWidthOf(TSmbiosStructure const& processor) {
+  constexpr std::uint16_t unknown = 0x02, is64Bit = 0x04;
+  auto const characteristics = processor.Word(0x26);
+  if (!characteristics) return characteristics.Why();
+  if (*characteristics & is64Bit) return std::uint16_t(64);
+  if (*characteristics == 0 || *characteristics & unknown) return Unknown();
+  return std::uint16_t(32);
+}
+
+// The eight bytes of the processor's identifier, in their order.
+TFinding<std::string> ProcessorIdOf(TSmbiosStructure const& processor) {
+  auto const id = processor.Bytes(0x08, 8);
+  if (!id) return id.Why();
+  if (AreAll(*id, 0)) return TMissing{kMissingNotGiven, "the firmware gives none (all zeros)"};
+  std::string text;
+  for (unsigned char byte : *id) {
+    char digits[3];
+    std::snprintf(digits, sizeof digits, "%02X", byte);
+    text += digits;
+  }
+  return text;
+}
+
+// 255 in the first field stands for the wider second one, where the structure has it.
+TFinding<std::uint16_t> EnabledCoresOf(TSmbiosStructure const& processor) {
+  auto const cores = processor.Byte(0x24);
+  if (IsNumber(cores, 0xff)) {
+    if (auto const wide = processor.Word(0x2c)) return NumberOf<std::uint16_t>(wide, std::uint16_t(0));
+  }
+  return NumberOf<std::uint16_t>(cores, std::uint8_t(0));
+}
+
+// ---- Memory ----
+
+// Numbers of CIM for those of SMBIOS, from 0; -1 where SMBIOS says unknown, or knows none.
+constexpr int kFormFactors[] = {-1, 1, -1, 7, 2, 1, 3, 4, 6, 8, 9, 1, 11, 12, 13, 8, 1};
+constexpr int kMemoryTypes[] = {-1, 1,  -1, 2,  6,  7,  8,  9,  10, 11, 12, 13, 14, 15, 16, 17,
+                                18, 19, 20, 21, 23, -1, -1, -1, 24, 25, 26, 27, 28, 29, 30};
+
+// A number that SMBIOS gives and the table does not have, such as that of a newer kind of memory, is "Other".
+template <std::size_t N>
+TFinding<std::uint16_t> CimNumberOf(TFinding<std::uint8_t> const& found, int const (&table)[N]) {
+  constexpr std::uint16_t other = 1;
+  if (!found) return found.Why();
+  if (*found >= N) return other;
+  if (table[*found] < 0) return Unknown();
+  return static_cast<std::uint16_t>(table[*found]);
+}
+
+// In bytes. The size field counts kilobytes or megabytes; from 32 GB on the extended one holds megabytes.
+TFinding<std::uint64_t> CapacityOf(TSmbiosStructure const& memoryDevice) {
+  constexpr std::uint16_t unknown = 0xffff, seeExtended = 0x7fff, inKilobytes = 0x8000;
+  auto const size = memoryDevice.Word(0x0c);
+  if (IsNumber(size, seeExtended)) {
+    auto const megabytes = memoryDevice.DWord(0x1c);
+    if (!megabytes) return megabytes.Why();
+    return std::uint64_t(*megabytes & 0x7fffffff) << 20;
+  }
+  auto const number = NumberOf<std::uint64_t>(size, unknown);
+  if (!number) return number.Why();
+  return *number & inKilobytes ? (*number & ~std::uint64_t(inKilobytes)) << 10 : *number << 20;
+}
+
+// In transfers per second, by the million, which CIM calls megahertz. 65535 stands for the wider extended field.
+TFinding<std::uint32_t> SpeedOf(TSmbiosStructure const& memoryDevice, std::size_t offset, std::size_t extendedOffset) {
+  constexpr std::uint16_t unknown = 0, seeExtended = 0xffff;
+  auto const speed = memoryDevice.Word(offset);
+  if (!IsNumber(speed, seeExtended)) return NumberOf<std::uint32_t>(speed, unknown);
+  auto const extended = memoryDevice.DWord(extendedOffset);
+  if (!extended) return extended.Why();
+  return NumberOf<std::uint32_t>(TFinding<std::uint32_t>(*extended & 0x7fffffff), std::uint32_t(0));
+}
+
+}  // namespace
+
+TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name) {
+  TRecord record("QRVSG_ComputerSystem", name.fSource);
+  record.AddKey("CreationClassName", "QRVSG_ComputerSystem");
+  record.AddKey("Name", TFinding<std::string>(name.fName));
+  record.SetSource(source);
+  record.Add("Manufacturer", TextOf(system, 0x04));
+  record.Add("ProductName", TextOf(system, 0x05));
+  record.Add("Version", TextOf(system, 0x06));
+  record.Add("SerialNumber", TextOf(system, 0x07));
+  record.Add("UUID", UuidOf(system));
+  record.Add("SKUNumber", TextOf(system, 0x19));
+  record.Add("Family", TextOf(system, 0x1a));
+  return record;
+}
+
+TRecord BiosRecord(TSmbiosStructure const& bios, std::string const& source, unsigned number) {
+  constexpr unsigned short running = 3, unknownSystem = 0;
+  TRecord record("CIM_BIOSElement", source);
+  record.AddKey("Name", "BIOS " + std::to_string(number));
+  record.AddKey("Version", TextOf(bios, 0x05));
+  record.AddKey("SoftwareElementState", running);
+  record.AddKey("SoftwareElementID", "BIOS " + std::to_string(number));
+  record.AddKey("TargetOperatingSystem", unknownSystem);
+  record.Add("Manufacturer", TextOf(bios, 0x04));
+  record.Add("ReleaseDate", DateOf(TextOf(bios, 0x08)));
+  record.Add("LoadedStartingAddress", StartAddressOf(bios));
+  record.Add("LoadedEndingAddress", EndAddressOf(bios));
+  return record;
+}
+
+TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source, unsigned number) {
+  TRecord record("CIM_Chassis", source);
+  record.AddKey("Tag", "Chassis " + std::to_string(number));
+  record.AddKey("CreationClassName", "CIM_Chassis");
+  record.Add("Manufacturer", TextOf(chassis, 0x04));
+  record.Add("Version", TextOf(chassis, 0x06));
+  record.Add("SerialNumber", TextOf(chassis, 0x07));
+  record.Add("UserTracking", TextOf(chassis, 0x08));
+  record.Add("SKU", ChassisSkuOf(chassis));
+  record.Add("ChassisPackageType", ChassisPackageTypeOf(chassis));
+  record.Add("ChassisTypeDescription", ChassisTypeNameOf(chassis));
+  record.Add("LockPresent", LockOf(chassis));
+  record.Add("Height", HeightOf(chassis));
+  record.Add("NumberOfPowerCords", NumberOf<std::uint16_t>(chassis.Byte(0x12), std::uint8_t(0)));
+  return record;
+}
+
+TRecord ProcessorRecord(TSmbiosStructure const& processor, std::string const& source, unsigned number, TSystemName const& name) {
+  TRecord record("CIM_Processor", source);
+  record.AddKey("SystemCreationClassName", "QRVSG_ComputerSystem");
+  record.AddKey("SystemName", name.fName);
+  record.AddKey("CreationClassName", "CIM_Processor");
+  record.AddKey("DeviceID", "Processor " + std::to_string(number));
+  record.Add("Name", TextOf(processor, 0x04));
+  record.Add("ElementName", TextOf(processor, 0x10));
+  record.Add("Role", RoleOf(processor));
+  record.Add("Family", FamilyOf(processor));
+  record.Add("UpgradeMethod", UpgradeMethodOf(processor));
+  record.Add("MaxClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x14), std::uint16_t(0)));
+  record.Add("CurrentClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x16), std::uint16_t(0)));
+  record.Add("ExternalBusClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x12), std::uint16_t(0)));
+  record.Add("DataWidth", DataWidthOf(processor));
+  record.Add("UniqueID", ProcessorIdOf(processor));
+  record.Add("CPUStatus", CpuStatusOf(processor));
+  record.Add("NumberOfEnabledCores", EnabledCoresOf(processor));
+  return record;
+}
+
+TRecord MemoryRecord(TSmbiosStructure const& memoryDevice, std::string const& source, unsigned number) {
+  TRecord record("CIM_PhysicalMemory", source);
+  record.AddKey("Tag", "Memory device " + std::to_string(number));
+  record.AddKey("CreationClassName", "CIM_PhysicalMemory");
+  record.Add("ElementName", TextOf(memoryDevice, 0x10));
+  record.Add("BankLabel", TextOf(memoryDevice, 0x11));
+  record.Add("Manufacturer", TextOf(memoryDevice, 0x17));
+  record.Add("SerialNumber", TextOf(memoryDevice, 0x18));
+  record.Add("UserTracking", TextOf(memoryDevice, 0x19));
+  record.Add("PartNumber", TextOf(memoryDevice, 0x1a));
+  record.Add("Capacity", CapacityOf(memoryDevice));
+  record.Add("FormFactor", CimNumberOf(memoryDevice.Byte(0x0e), kFormFactors));
+  record.Add("MemoryType", CimNumberOf(memoryDevice.Byte(0x12), kMemoryTypes));
+  record.Add("TotalWidth", NumberOf<std::uint16_t>(memoryDevice.Word(0x08), std::uint16_t(0xffff)));
+  record.Add("DataWidth", NumberOf<std::uint16_t>(memoryDevice.Word(0x0a), std::uint16_t(0xffff)));
+
+  // The speed is given in megahertz, so that the time in nanoseconds is not.
+  auto const speed = SpeedOf(memoryDevice, 0x15, 0x54);
+  record.Add("IsSpeedInMhz", TFinding<bool>(static_cast<bool>(speed)));
+  record.Add("MaxMemorySpeed", speed);
+  record.Add("ConfiguredMemoryClockSpeed", SpeedOf(memoryDevice, 0x20, 0x58));
+  return record;
+}
+
+bool IsSocketFilled(TSmbiosStructure const& processor) {
+  constexpr std::uint8_t populated = 0x40;
+  auto const status = processor.Byte(0x18);
+  return !status || *status & populated;
+}
+
+bool IsSlotFilled(TSmbiosStructure const& memoryDevice) { return !IsNumber(memoryDevice.Word(0x0c), std::uint16_t(0)); }
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,147 @@
+// The examples do what the documentation says, and the documentation shows the code of the examples.
+
+#include "TOSSpecific.h"
+#include "tests/Support.h"
+#include "zepcore.h"
+
+#include <gmock/gmock.h>
+
+#include <cstdio>
+#include <memory>
+#include <regex>
+#include <sstream>
+
+namespace NQRVZEP20 {
+namespace {
+
+TCIMContext const kNone;
+
+std::string SourceFile(std::string const& name) { return ReadFile(std::string(ZEP_SOURCE_DIR) + "/" + name); }
+
+// ---- The plug-in ----
+
+class ClockTest : public testing::Test {
+protected:
+  static void SetUpTestSuite() { TOSSpecific::LoadPluginLibrary(ZEP_CLOCK_PLUGIN); }
+
+  ClockTest() : ns_(TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Clock")->GetNamespace(kNone)) {}
+
+  boost::shared_ptr<ICIMInstance> Find(std::string const& path) const {
+    return ns_->GetInstance(TCIMReference(ns_, "ns:" + path, kNone), kNone);
+  }
+
+  boost::shared_ptr<ICIMNamespace> const ns_;
+};
+
+TEST_F(ClockTest, RegistersItselfWithItsNamespace) {
+  EXPECT_EQ(ns_->GetName(kNone), "root/clock");
+  EXPECT_EQ(TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Clock")->GetNamespace(kNone), ns_);
+}
+
+TEST_F(ClockTest, TellsOfEachClock) {
+  for (char const* name : {"realtime", "monotonic", "boottime"}) {
+    SCOPED_TRACE(name);
+    auto const clock = Find("X_Clock.Name=\"" + std::string(name) + "\"");
+    ASSERT_TRUE(clock);
+    EXPECT_EQ(clock->GetClass(kNone)->GetSuperClass(kNone)->GetName(kNone), "X_TimeSource");
+    unsigned long const seconds = clock->GetProperty("Seconds", kNone)->GetValue(kNone);
+    EXPECT_GT(seconds, 0u);
+    unsigned long const resolution = clock->GetProperty("ResolutionNanoseconds", kNone)->GetValue(kNone);
+    EXPECT_GT(resolution, 0u);
+    unsigned short const kind = clock->GetProperty("Kind", kNone)->GetValue(kNone);
+    EXPECT_EQ(kind, std::string(name) == "realtime" ? 1 : 2);
+  }
+}
+
+TEST_F(ClockTest, AssociatesClocks) {
+  std::vector<boost::shared_ptr<ICIMInstance>> associations;
+  ns_->GetClass("X_RunsAtTheRateOf", kNone)->EnumerateInstances(TAddToVectorCallback<ICIMInstance>(associations), kNone);
+  ASSERT_EQ(associations.size(), 1u);
+  TCIMReference const leader = associations[0]->GetProperty("Leader", kNone)->GetValue(kNone);
+  EXPECT_EQ(leader.GetCIMElement(false), Find("X_Clock.Name=\"realtime\""));
+  EXPECT_TRUE(associations[0]->GetClass(kNone)->GetClassFlag(kNone));
+}
+
+// ---- The programs ----
+
+std::string OutputOf(std::string const& command) {
+  std::unique_ptr<FILE, int (*)(FILE*)> const pipe(::popen(command.c_str(), "r"), ::pclose);
+  std::string output;
+  for (int c; (c = std::fgetc(pipe.get())) != EOF;) output += static_cast<char>(c);
+  return output;
+}
+
+TEST(ReadmeExampleTest, PrintsTheMachineTypeAndModelOfTheSample) {
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", ZEP_SOURCE_DIR "/tools/zep/sample/smbios.bin");
+  EXPECT_EQ(OutputOf(ZEP_README_EXAMPLE), "1234AB7\n");
+}
+
+TEST(ListProviderTest, EndsInTheStatusOfAPlugInThatDoesNotLoad) {
+  EXPECT_EQ(OutputOf(ZEP_LIST_PROVIDER " /nowhere/libNone.nsp.so 2>&1; echo $?"), "kZEPStatusFileSystemError\n1\n");
+}
+
+// ---- The documentation ----
+
+struct TBlock {
+  std::string language, text;
+};
+
+// The fenced blocks of a document, in their order.
+std::vector<TBlock> BlocksOf(std::string const& document) {
+  std::vector<TBlock> blocks;
+  bool isInside = false;
+  std::istringstream lines(SourceFile(document));
+  for (std::string line; std::getline(lines, line);) {
+    bool const isFence = line.rfind("```", 0) == 0;
+    if (isFence && !isInside)
+      blocks.push_back({line.substr(3), ""});
+    else if (!isFence && isInside)
+      blocks.back().text += line + "\n";
+    isInside = isInside != isFence;
+  }
+  return blocks;
+}
+
+std::string FirstBlockOf(std::string const& document, std::string const& language) {
+  for (TBlock const& block : BlocksOf(document))
+    if (block.language == language) return block.text;
+  return "";
+}
+
+// Expects that the document's blocks of that language stand in the source file, word for word and in the same order.
+void ExpectBlocksFrom(std::string const& document, std::string const& language, std::string const& sourceName, int count) {
+  std::string const source = SourceFile(sourceName);
+  ASSERT_FALSE(source.empty()) << sourceName;
+  std::size_t position = 0;
+  int found = 0;
+  for (TBlock const& block : BlocksOf(document)) {
+    if (block.language != language) continue;
+    std::size_t const at = source.find(block.text, position);
+    ASSERT_NE(at, std::string::npos) << "not in " << sourceName << ":\n" << block.text;
+    position = at + block.text.size();
+    ++found;
+  }
+  EXPECT_EQ(found, count);
+}
+
+TEST(DocumentationTest, ReadmeShowsTheCodeOfTheExample) {
+  ExpectBlocksFrom("README.md", "cpp", "examples/ReadmeExample.cpp", 1);
+}
+
+TEST(DocumentationTest, WalkThroughShowsTheCodeOfTheExample) {
+  ExpectBlocksFrom("docs/writing-a-provider.md", "cpp", "examples/Clock/Clock.cpp", 6);
+  ExpectBlocksFrom("docs/writing-a-provider.md", "cmake", "examples/Clock/CMakeLists.txt", 1);
+  EXPECT_EQ(FirstBlockOf("docs/writing-a-provider.md", "cmake"), SourceFile("examples/Clock/CMakeLists.txt"));
+}
+
+// Clocks run on: every number behind " = " is as good as another.
+std::string WithoutNumbers(std::string const& text) { return std::regex_replace(text, std::regex(" = \\d+"), " = N"); }
+
+TEST(DocumentationTest, WalkThroughShowsWhatListProviderPrints) {
+  std::string const command = "$ build/release/examples/ListProvider build/release/examples/libClock.nsp.so\n";
+  std::string const shown = FirstBlockOf("docs/writing-a-provider.md", "console");
+  EXPECT_EQ(WithoutNumbers(shown), command + WithoutNumbers(OutputOf(ZEP_LIST_PROVIDER " " ZEP_CLOCK_PLUGIN)));
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

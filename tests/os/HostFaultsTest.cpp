@@ -1,0 +1,293 @@
+// Every call of the C library that a host service makes fails in turn (tests/os/faults): what the operation reports then,
+// and that it leaves nothing behind and comes to an end.
+
+#include "tests/os/HostTools.h"
+#include "tests/os/Programs.h"
+
+#include <cerrno>
+#include <map>
+
+namespace NQRVZEP20 {
+namespace {
+
+namespace fs = std::filesystem;
+using TLines = std::vector<std::string>;
+
+struct TOutcome {
+  TLines lines;                      // the result, what was logged, what is left behind
+  std::map<std::string, int> calls;  // of which function, and how many
+  bool fired;
+};
+
+// Does one operation in a directory of its own, with a fault (FUNCTION:NUMBER:ERRNO) or without one.
+TOutcome Do(std::string const& operation, std::string const& fault = "") {
+  TTempDir const dir;
+  WriteFile(dir.Path("small"), "0123456789");
+  WriteFile(dir.Path("large"), std::string(2000000, 'x'));
+  WriteFile(dir.Path("zep.cfg"), "a=1\nb=2");
+  fs::create_directories(dir.Path("tree/below"));
+  WriteFile(dir.Path("tree/below/file"), "text");
+  fs::create_directories(dir.Path("bin"));
+  for (char const* command : {"bin/cp", "bin/vi"}) {  // which do nothing
+    WriteFile(dir.Path(command), "#!/bin/sh\n");
+    fs::permissions(dir.Path(command), fs::perms::all);
+  }
+
+  std::string const program = ZEP_BUILD_DIR "/tests/programs/FaultyOperation " + operation;
+  TProgramRun const run = RunProgram("cd " + dir.Path() + " && PATH=" + dir.Path("bin") + ":$PATH ZEP_FAULT=" + fault +
+                                     " LD_PRELOAD=" ZEP_FAULTS " timeout 30 " + program + " < /dev/null 2> /dev/null");
+  TOutcome outcome{{}, {}, false};
+  if (run.exitCode != 0) outcome.lines.push_back("exit code " + std::to_string(run.exitCode));
+  std::istringstream output(run.output);
+  std::string line;
+  while (std::getline(output, line) && line != "calls") {
+    if (line == "fault")
+      outcome.fired = true;
+    else
+      outcome.lines.push_back(line);
+  }
+  std::string function;
+  for (int count; output >> function >> count;) outcome.calls[function] = count;
+  return outcome;
+}
+
+struct TFault {
+  std::string function;  // "child." for a child before its exec
+  std::string number;    // which call, or "all"
+  int error;             // for write also 0 (nothing written) and -1 (half)
+  TLines lines;
+};
+
+struct TOperation {
+  std::string name;
+  TLines lines;  // without a fault
+  std::vector<TFault> faults;
+};
+
+void PrintTo(TOperation const& operation, std::ostream* stream) { *stream << operation.name; }
+
+std::string const kChild = Child("PrintsArguments");
+
+// What starting, reading and waiting for a child comes to in every operation that does it. Each names its own result when
+// the child ran as it should, when it was left or failed after its output was read, and before.
+std::vector<TFault> SpawnFaults(TLines const& log, std::string const& good, std::string const& badWithOutput,
+                                std::string const& badWithout, std::string const& goodWithout) {
+  auto const with = [&log](std::string const& result, TLines const& more = {}) {
+    TLines lines{result};
+    lines.insert(lines.end(), log.begin(), log.end());
+    lines.insert(lines.end(), more.begin(), more.end());
+    return lines;
+  };
+  return {
+      {"pipe", "1", EMFILE, with(badWithout, {"[Debug] ERROR: SpawnProcess - pipe call failed!"})},
+      {"vfork", "1", EAGAIN, with("threw kZEPStatusFail", {"[Error] ERROR: Fork failed"})},
+      {"close", "all", EINTR, with(good)},
+      {"select", "1", EINTR, with(badWithout, {"[Debug] ERROR: SpawnProcess - select call failed!", "a child left"})},
+      {"select", "2", EINTR, with(badWithOutput, {"[Debug] ERROR: SpawnProcess - select call failed!", "a child left"})},
+      {"read", "all", EINTR, with(good)},  // appends nothing, and the next one reads
+      {"waitpid", "1", ECHILD, with(badWithOutput, {"[Debug] ERROR: SpawnProcess - waitpid call failed!", "a child left"})},
+      {"child.close", "all", EINTR, with(good)},
+      {"child.dup2", "1", EINTR, with(goodWithout)},  // its output goes nowhere
+      {"child.dup2", "2", EINTR, with(good)},
+      {"child.sigaction", "all", EINVAL, with(good)},
+  };
+}
+
+std::vector<TFault> operator+(std::vector<TFault> faults, std::vector<TFault> const& more) {
+  faults.insert(faults.end(), more.begin(), more.end());
+  return faults;
+}
+
+std::vector<TOperation> Operations() {
+  std::string const path = "[" + kChild + "]";
+  std::string const spawn = "[Debug] SpawnProcess: process " + kChild, spawnFind = "[Debug] SpawnProcess: process find";
+  TLines const spawnWithEnvironment = {"[Debug] TOSSpecific::SpawnProcess calling " + kChild, "with parameters " + kChild + " ",
+                                       "with envoirment vars A=1 "};
+  std::string const fileError = "threw kZEPStatusFileSystemError", notFound = "threw kZEPStatusFileNotFound";
+  std::string const returned = "[Debug] Debug (linux toss): GetFileContents() Returned: 0123456789";
+  std::string const returnedLarge =
+      ("[Debug] Debug (linux toss): GetFileContents() Returned: " + std::string(500, 'x')).substr(0, 500);
+  std::string const readFailed = "[Status] GetFileContents failed to read file small";
+  std::string const captureFailed = "[Error] failed to capture file content due to exception: ";
+  std::string const deleting = "[Debug] Entering TOSSpecific::deleteFile, path=small",
+                    deleted = "[Debug] Exiting TOSSpecific::deleteFile";
+  TLines const created = {"[Debug] Entering TOSSpecific::createFile, path=new", "[Debug] Successfully created file: new",
+                          "[Debug] Exiting TOSSpecific::createFile"};
+  std::string const opening = "[Debug] TOSSpecific::OpenOutputFileStream -- Entering ";
+  std::string const openFailed = "[Error] TOSSpecific::OpenOutputFileStream --  Failed to open output file: new";
+  std::string const parsing = "[Debug] TConfig::parseConfigFile(): start to parse config file";
+  std::string const missing = "[Error] TConfig::parseConfigFile(): config file doesn't exist";
+  std::string const mapIsEmpty = "[Error] TConfig::getValue(): map is empty";
+
+  return {
+      {"SpawnProcess",
+       {"0 " + path, spawn},
+       SpawnFaults({spawn}, "0 " + path, "-1 " + path, "-1 ", "0 ") +
+           std::vector<TFault>{{"child.execvp", "1", ENOENT, {"-1 ", spawn}}}},
+      {"SpawnProcessWithEnvironment",
+       {"0 " + path, spawnWithEnvironment[0], spawnWithEnvironment[1], spawnWithEnvironment[2]},
+       SpawnFaults(spawnWithEnvironment, "0 " + path, "-1 " + path, "-1 ", "0 ") +
+           std::vector<TFault>{{"child.execve",
+                                "1",
+                                ENOENT,
+                                {"-1 ", spawnWithEnvironment[0], spawnWithEnvironment[1], spawnWithEnvironment[2]}}}},
+      {"FindFile",
+       {"tree/below/file", spawnFind},
+       SpawnFaults({spawnFind}, "tree/below/file", "tree/below/file", "", "") +
+           std::vector<TFault>{{"child.execvp", "1", ENOENT, {"", spawnFind}}}},
+      {"CapFileViaProc",
+       {"0123456789", spawn, returned},
+       {{"pipe", "1", EMFILE, {"0123456789", spawn, "[Debug] ERROR: SpawnProcess - pipe call failed!", returned}},
+        {"vfork", "1", EAGAIN, {"", spawn, "[Error] ERROR: Fork failed", captureFailed + "kZEPStatusFail"}},
+        {"close", "all", EINTR, {"0123456789", spawn, returned}},
+        {"select",
+         "1",
+         EINTR,
+         {"0123456789", spawn, "[Debug] ERROR: SpawnProcess - select call failed!", returned, "a child left"}},
+        {"waitpid",
+         "1",
+         ECHILD,
+         {"0123456789", spawn, "[Debug] ERROR: SpawnProcess - waitpid call failed!", returned, "a child left"}},
+        {"child.close", "all", EINTR, {"0123456789", spawn, returned}},
+        {"child.dup2", "all", EINTR, {"0123456789", spawn, returned}},
+        {"child.sigaction", "all", EINTR, {"0123456789", spawn, returned}},
+        {"child.execvp", "1", ENOENT, {"0123456789", spawn, returned}},
+        {"open",
+         "1",
+         EACCES,
+         {"", spawn, "[Error] ERROR: CaptureFile failed to open: small", captureFailed + "kZEPStatusFileNotFound"}},
+        {"fstat", "1", EIO, {"0123456789", spawn, returned}},
+        {"read", "1", EIO, {"0123456789", spawn, returned}},
+        {"read", "3", EIO, {"", spawn, readFailed, captureFailed + "kZEPStatusFileSystemError"}},
+        {"read", "4", EIO, {"", spawn, readFailed, captureFailed + "kZEPStatusFileSystemError"}}}},
+      {"CaptureFile",
+       {"0123456789", returned},
+       {{"open", "1", EACCES, {notFound, "[Error] ERROR: CaptureFile failed to open: small"}},
+        {"fstat", "1", EIO, {"0123456789", returned}},
+        {"read", "all", EIO, {fileError, readFailed}},
+        {"close", "1", EINTR, {"0123456789", returned}}}},
+      {"CaptureFileOfSeveralReads",
+       {"2000000", returnedLarge},
+       {{"open", "1", EMFILE, {notFound, "[Error] ERROR: CaptureFile failed to open: large"}},
+        {"fstat", "1", EIO, {"2000000", returnedLarge}},
+        {"read", "2", EINTR, {fileError, "[Status] GetFileContents failed to read file large"}},
+        {"read", "all", EIO, {fileError, "[Status] GetFileContents failed to read file large"}},
+        {"close", "1", EINTR, {"2000000", returnedLarge}}}},
+      {"CaptureFileLoader",
+       {"0123456789", returned},
+       {{"open",
+         "1",
+         EACCES,
+         {"", "[Debug] CaptureFile failed to open: small",
+          "[Debug] Please confirm that the related software/driver is properly installed."}},
+        {"fstat", "1", EIO, {"0123456789", returned}},
+        {"read", "all", EIO, {fileError, readFailed}},
+        {"close", "1", EINTR, {"0123456789", returned}}}},
+      {"LaunchTextEditor", {"done"}, {{"getcwd", "1", ERANGE, {"done"}}, {"system", "all", EAGAIN, {"done"}}}},
+      {"GetFileSize", {"10"}, {{"stat", "all", EACCES, {notFound}}}},
+      {"FileCopy",
+       {"copied, 0123456789"},
+       {{"stat", "1", EACCES, {fileError}},
+        {"open", "all", EACCES, {fileError}},
+        {"read", "1", EIO, {fileError}},
+        {"read", "2", EIO, {fileError + ", 0123456789"}},
+        {"write", "1", ENOSPC, {fileError}},
+        {"write", "1", 0, {"copied"}},          // a write of nothing ends the copy, and its result is 0
+        {"write", "1", -1, {"copied, 01234"}},  // a short write is not made up for
+        {"close", "all", EIO, {"copied, 0123456789"}}}},
+      {"FileCopyOfALargeFile",
+       {"copied, all"},
+       {{"stat", "1", EACCES, {fileError + ", not all"}},
+        {"open", "all", EACCES, {fileError + ", not all"}},
+        {"copy_file_range", "all", EXDEV, {"copied, all"}},  // whatever the kernel did not copy is read and written
+        {"read", "1", EIO, {fileError + ", all"}},
+        {"close", "all", EIO, {"copied, all"}}}},
+      {"DirCopy",
+       {"0, text"},
+       {{"opendir", "all", EMFILE, {fileError}},
+        {"stat", "1", EIO, {"0, text"}},  // whether the destination is there: it is made
+        {"stat", "2", EIO, {"0"}},        // the directory in the source: passed over
+        {"stat", "3", EIO, {"0, text"}},
+        {"stat", "4", EIO, {"0"}},        // the file in that directory: passed over
+        {"stat", "5", EIO, {fileError}},  // FileCopy's own
+        {"mkdir", "1", EACCES, {"threw kZEPStatusAccessDenied"}},
+        {"mkdir", "2", ENOSPC, {fileError}},
+        {"readdir", "1", EIO, {"0"}},  // as at its end
+        {"open", "all", EMFILE, {fileError}},
+        {"read", "1", EIO, {fileError}},
+        {"write", "1", ENOSPC, {fileError}},
+        {"close", "all", EIO, {"0, text"}},
+        {"closedir", "1", EIO, {"0, text"}},
+        {"closedir", "2", EIO, {"-1, text"}}}},
+      {"ListDir",
+       {"file"},
+       {{"opendir", "1", EMFILE, {fileError}}, {"readdir", "1", EIO, {""}}, {"closedir", "1", EIO, {"file"}}}},
+      {"deleteFile", {"true, gone", deleting, deleted}, {{"system", "1", EAGAIN, {"true, there", deleting, deleted}}}},
+      {"createFile",
+       {"true, text", created[0], created[1], created[2]},
+       {{"open", "1", EACCES, {"false", created[0], "[Debug] Unable to create file, errno=13"}},
+        {"open", "1", ENOSPC, {"false", created[0], "[Debug] Unable to create file, errno=28"}},
+        {"write", "1", ENOSPC, {"true", created[0], created[1], created[2]}},
+        {"write", "1", -1, {"true, te", created[0], created[1], created[2]}},
+        {"close", "1", EIO, {"true, text", created[0], created[1], created[2]}}}},
+      {"OpenOutputFileStream",
+       {"opened", opening, "[Debug] TOSSpecific::OpenOutputFileStream -- Exting "},
+       {{"fopen64", "1", EACCES, {"threw kZEPStatusAccessDenied", opening, openFailed}},
+        {"fopen64", "1", EROFS, {fileError, opening, openFailed}}}},
+      {"GetCurrentDir", {"true"}, {{"getcwd", "1", ERANGE, {"threw kZEPStatusFail"}}}},
+      {"PutEnvironment",
+       {"true"},
+       {{"setenv", "1", ENOMEM, {"false", "[Debug] TOSSpecific debug output: [ERROR]PutEnvironment occured errors."}}}},
+      {"IsKeyWaiting",
+       {"false"},
+       {{"tcgetattr", "1", EIO, {"false"}}, {"tcsetattr", "all", EIO, {"false"}}, {"select", "1", EINTR, {"true"}}}},
+      {"GetKeyboardChar",
+       {"107"},
+       {{"tcgetattr", "1", EIO, {"107"}}, {"tcsetattr", "all", EIO, {"107"}}, {"read", "1", EINTR, {"-1"}}}},
+      {"USleep", {"0"}, {{"usleep", "1", EINTR, {"-1"}}}},
+      {"LaunchCommandShell", {"0"}, {{"system", "1", EAGAIN, {"-1"}}}},
+      {"TConfig",
+       {"a,b", parsing},
+       {{"stat", "all", EACCES, {"", parsing, missing, mapIsEmpty}},
+        {"fopen64", "1", EACCES, {"", parsing, mapIsEmpty}},
+        {"read", "1", EIO, {"", parsing, mapIsEmpty}},
+        {"read", "2", EIO, {"a", parsing}}}},  // the line that it broke off is not counted
+  };
+}
+
+class HostFaultsTest : public testing::TestWithParam<TOperation> {};
+
+TEST_P(HostFaultsTest, EveryCallFailsInTurn) {
+  TOutcome const clean = Do(GetParam().name);
+  EXPECT_EQ(clean.lines, GetParam().lines);
+  EXPECT_FALSE(clean.fired);
+
+  std::map<std::string, int> untried = clean.calls;
+  for (TFault const& fault : GetParam().faults) {
+    untried.erase(fault.function);
+    int const calls = clean.calls.count(fault.function) ? clean.calls.at(fault.function) : 0;
+    EXPECT_TRUE(calls > 0 || kIsSanitized) << fault.function << " is not called";
+    // Of many calls with one outcome the first, the second and the last will do.
+    for (int number = 1; number <= calls; ++number) {
+      if (fault.number == "all" ? number > 2 && number < calls : fault.number != std::to_string(number)) continue;
+      std::string const name = fault.function + ":" + std::to_string(number) + ":" + std::to_string(fault.error);
+      SCOPED_TRACE(name);
+      TOutcome const outcome = Do(GetParam().name, name);
+      EXPECT_TRUE(outcome.fired);
+      EXPECT_EQ(outcome.lines, fault.lines);
+    }
+  }
+  for (auto const& [function, calls] : untried) ADD_FAILURE() << function << " is called " << calls << " times and never failed";
+}
+
+INSTANTIATE_TEST_SUITE_P(Operations, HostFaultsTest, testing::ValuesIn(Operations()),
+                         [](auto const& operation) { return operation.param.name; });
+
+TEST(HostFaultsWithoutMemoryTest, AConfigurationThatCannotBeOpenedForLackOfMemoryIsLogged) {
+  EXPECT_EQ(Do("TConfigWithoutMemory").lines, (TLines{"", "[Debug] TConfig::parseConfigFile(): start to parse config file",
+                                                      "[Error] TConfig::parseConfigFile(): Open config file zep.cfg failed",
+                                                      "[Error] TConfig::getValue(): map is empty"}));
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

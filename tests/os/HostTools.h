@@ -1,0 +1,111 @@
+#pragma once
+
+// What the tests of the host services share.
+
+#include "TOSSpecific.h"
+#include "tests/Support.h"
+
+#include <grp.h>
+#include <sched.h>
+#include <sys/mount.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <iterator>
+
+namespace NQRVZEP20 {
+
+// A sanitizer makes some calls for itself: vfork among them, which that for threads turns into fork.
+#if defined(__has_feature)
+constexpr bool kIsSanitized = __has_feature(address_sanitizer) || __has_feature(thread_sanitizer);
+#else
+constexpr bool kIsSanitized = false;
+#endif
+
+// The path of a program of tests/os/children.
+inline std::string Child(std::string const& name) { return std::string(ZEP_CHILDREN_DIR) + "/" + name; }
+
+// Everything that the function logs, on a thread of its own: "[Debug] SpawnProcess: process ls".
+template <class TFunction>
+std::vector<std::string> LogOf(TFunction function) {
+  std::vector<std::string> entries;
+  OnNewThread([&] {
+    TLogCapture const log;
+    function();
+    entries = log.Entries();
+  });
+  return entries;
+}
+
+// Works in another directory, and in the old one again at the end.
+class TWorkingDirectory {
+public:
+  explicit TWorkingDirectory(std::string const& path) : fOld(std::filesystem::current_path()) {
+    std::filesystem::current_path(path);
+  }
+  ~TWorkingDirectory() { std::filesystem::current_path(fOld); }
+  TWorkingDirectory(TWorkingDirectory const&) = delete;
+  TWorkingDirectory& operator=(TWorkingDirectory const&) = delete;
+
+private:
+  std::filesystem::path fOld;
+};
+
+inline int OpenDescriptors() {
+  using TEntries = std::filesystem::directory_iterator;
+  return static_cast<int>(std::distance(TEntries("/proc/self/fd"), TEntries()));
+}
+
+// Whether this process has a child, running or ended and not waited for.
+inline bool HasChildren() {
+  siginfo_t info;
+  return ::waitid(P_ALL, 0, &info, WEXITED | WNOHANG | WNOWAIT) == 0;
+}
+
+// The text that the function returns in a child process, whose memory, user and mounts are its own: what it changes does
+// not come back. What it throws is text as well; a child that dies says so.
+template <class TFunction>
+std::string InChild(TFunction function) {
+  int ends[2];
+  if (::pipe(ends) != 0) return "no pipe";
+  pid_t const child = ::fork();
+  if (child == 0) {
+    std::string result;
+    try {
+      result = function();
+    } catch (std::exception const& thrown) {
+      result = std::string("threw ") + thrown.what();
+    }
+    bool const arrived = ::write(ends[1], result.data(), result.size()) == static_cast<ssize_t>(result.size());
+    ::_exit(arrived ? 0 : 1);
+  }
+  ::close(ends[1]);
+  std::string result;
+  char chunk[4096];
+  for (ssize_t got; (got = ::read(ends[0], chunk, sizeof chunk)) > 0;) result.append(chunk, static_cast<std::size_t>(got));
+  ::close(ends[0]);
+  int status = 0;
+  if (child < 0 || ::waitpid(child, &status, 0) != child || status != 0) return "the child died";
+  return result;
+}
+
+// For use in a child: gives up root's privileges, if there are any. False when it cannot.
+inline bool BecomeUnprivileged() {
+  constexpr int kNobody = 65534;
+  return ::geteuid() != 0 || (::setgroups(0, nullptr) == 0 && ::setgid(kNobody) == 0 && ::setuid(kNobody) == 0);
+}
+
+// For use in a child: mounts a file system of memory, which only this child sees. False when it may not.
+inline bool MountTmpfs(std::string const& path, std::string const& options) {
+  return ::unshare(CLONE_NEWNS) == 0 && ::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0 &&
+         ::mount("none", path.c_str(), "tmpfs", 0, options.c_str()) == 0;
+}
+
+// Whether a child may mount file systems.
+inline bool MayMount() {
+  TTempDir const dir;
+  return InChild([&] { return MountTmpfs(dir.Path(), "") ? "yes" : "no"; }) == "yes";
+}
+
+}  // namespace NQRVZEP20

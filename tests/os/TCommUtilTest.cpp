@@ -1,0 +1,104 @@
+#include "TCommUtil.h"
+
+#include "TOSSpecific.h"
+#include "tests/Support.h"
+
+namespace NQRVZEP20 {
+namespace {
+
+using TParts = std::vector<std::string>;
+
+TEST(SplitPathTest, AppendsThePiecesBetweenSeparators) {
+  struct TRow {
+    std::string path, separator;
+    TParts without, with;  // keepSeparator false and true
+  };
+  TRow const rows[] = {
+      {"", "/", {}, {}},
+      {"a", "/", {"a"}, {"a"}},
+      {"a/b/c", "/", {"a", "b", "c"}, {"a/", "b/", "c"}},
+      {"/var/log", "/", {"", "var", "log"}, {"/", "var/", "log"}},
+      {"/var/log/", "/", {"", "var", "log"}, {"/", "var/", "log/"}},
+      {"/", "/", {""}, {"/"}},
+      {"//", "/", {"", ""}, {"/", "/"}},
+      {"a//b", "/", {"a", "", "b"}, {"a/", "/", "b"}},
+      {"no separator", "/", {"no separator"}, {"no separator"}},
+      // Whatever the separator's length, one character of it is kept and stepped over.
+      {"a::b::", "::", {"a", ":b", ":"}, {"a:", ":b:", ":"}},
+      {"a:::b", "::", {"a", "", ":b"}, {"a:", ":", ":b"}},
+      {"::", "::", {"", ":"}, {":", ":"}},
+      {"ab", "abc", {"ab"}, {"ab"}},
+      // An empty separator is found everywhere.
+      {"ab", "", {"", ""}, {"a", "b"}},
+      {std::string("a\0b/c", 5), "/", {std::string("a\0b", 3), "c"}, {std::string("a\0b/", 4), "c"}},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.path + " at " + row.separator);
+    TParts without, with;
+    TCommUtil::SplitPath(row.path, without, row.separator, false);
+    TCommUtil::SplitPath(row.path, with, row.separator, true);
+    EXPECT_EQ(without, row.without);
+    EXPECT_EQ(with, row.with);
+  }
+}
+
+TEST(SplitPathTest, KeepsThePartsThatWereThere) {
+  TParts parts = {"first"};
+  TCommUtil::SplitPath("a/b", parts, "/", false);
+  EXPECT_EQ(parts, (TParts{"first", "a", "b"}));
+  TCommUtil::SplitPath("", parts, "/", false);
+  EXPECT_EQ(parts, (TParts{"first", "a", "b"}));
+}
+
+class MkDirHierTest : public testing::Test {
+protected:
+  TTempDir fDir;
+};
+
+TEST_F(MkDirHierTest, MakesEveryMissingDirectory) {
+  TCommUtil::MkDirHier(fDir.Path("a/b/c"));
+  EXPECT_TRUE(TOSSpecific::DirExists(fDir.Path("a/b/c")));
+  TCommUtil::MkDirHier(fDir.Path("a/b/d/e/"));
+  EXPECT_TRUE(TOSSpecific::DirExists(fDir.Path("a/b/d/e")));
+  TCommUtil::MkDirHier(fDir.Path("f//g"));
+  EXPECT_TRUE(TOSSpecific::DirExists(fDir.Path("f/g")));
+}
+
+TEST_F(MkDirHierTest, DoesNothingToAnExistingTree) {
+  TCommUtil::MkDirHier(fDir.Path("a/b"));
+  WriteFile(fDir.Path("a/b/file"), "kept");
+  EXPECT_NO_THROW(TCommUtil::MkDirHier(fDir.Path("a/b")));
+  EXPECT_NO_THROW(TCommUtil::MkDirHier(fDir.Path("a/b/")));
+  EXPECT_NO_THROW(TCommUtil::MkDirHier("/"));
+  EXPECT_NO_THROW(TCommUtil::MkDirHier(""));
+  EXPECT_EQ(ReadFile(fDir.Path("a/b/file")), "kept");
+}
+
+TEST_F(MkDirHierTest, FollowsARelativePathAndLinks) {
+  std::filesystem::path const old = std::filesystem::current_path();
+  std::filesystem::current_path(fDir.Path());
+  TCommUtil::MkDirHier("a/b/../c");
+  std::filesystem::create_symlink("a", "link");
+  TCommUtil::MkDirHier("link/d");
+  std::filesystem::current_path(old);
+  EXPECT_TRUE(TOSSpecific::DirExists(fDir.Path("a/b")));
+  EXPECT_TRUE(TOSSpecific::DirExists(fDir.Path("a/c")));
+  EXPECT_TRUE(TOSSpecific::DirExists(fDir.Path("a/d")));
+}
+
+TEST_F(MkDirHierTest, StopsAtAFileInTheWay) {
+  WriteFile(fDir.Path("file"), "");
+  EXPECT_STATUS(TCommUtil::MkDirHier(fDir.Path("file")), kZEPStatusDirectoryAlreadyExists);
+  EXPECT_STATUS(TCommUtil::MkDirHier(fDir.Path("file/")), kZEPStatusDirectoryAlreadyExists);
+  EXPECT_STATUS(TCommUtil::MkDirHier(fDir.Path("file/a")), kZEPStatusDirectoryAlreadyExists);
+}
+
+TEST_F(MkDirHierTest, LeavesWhatItMadeBeforeItStopped) {
+  std::string const tooLong(300, 'x');
+  EXPECT_STATUS(TCommUtil::MkDirHier(fDir.Path("a/b/" + tooLong + "/c")), kZEPStatusFileSystemError);
+  EXPECT_TRUE(TOSSpecific::DirExists(fDir.Path("a/b")));
+  EXPECT_FALSE(TOSSpecific::DirExists(fDir.Path("a/b/c")));
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,134 @@
+// The working directory, the environment, and paths below another.
+
+#include "TOSSpecific.h"
+#include "tests/os/HostTools.h"
+
+#include <sys/stat.h>
+
+namespace NQRVZEP20 {
+namespace {
+
+namespace fs = std::filesystem;
+using TEntries = std::vector<std::string>;
+
+// ---- GetCurrentDir ----
+
+TEST(GetCurrentDirTest, IsTheWorkingDirectory) {
+  TTempDir const dir;
+  TWorkingDirectory const directory(dir.Path());
+  EXPECT_EQ(TOSSpecific::GetCurrentDir(), dir.Path());
+  EXPECT_EQ(InChild([] {
+              fs::current_path("/");
+              return TOSSpecific::GetCurrentDir();
+            }),
+            "/");
+}
+
+// Goes down into directories of 100 characters each, and then into one that makes the path as long as asked.
+void GoDownTo(std::size_t length) {
+  std::size_t now = fs::current_path().string().size();
+  while (now < length) {
+    std::size_t const step = length - now > 202 ? 100 : length - now > 102 ? 50 : length - now - 1;
+    std::string const name(step, 'd');
+    if (::mkdir(name.c_str(), 0777) != 0 || ::chdir(name.c_str()) != 0) throw std::runtime_error("cannot go down");
+    now += step + 1;
+  }
+}
+
+TEST(GetCurrentDirTest, APathOf1023BytesIsTheLongest) {
+  TTempDir const dir;
+  auto const currentDirOfLength = [&](std::size_t length) {
+    return InChild([&] {
+      fs::create_directory(dir.Path(std::to_string(length)));
+      fs::current_path(dir.Path(std::to_string(length)));
+      GoDownTo(length);
+      return std::to_string(TOSSpecific::GetCurrentDir().size());
+    });
+  };
+  EXPECT_EQ(currentDirOfLength(1022), "1022");
+  EXPECT_EQ(currentDirOfLength(1023), "1023");
+  EXPECT_EQ(currentDirOfLength(1024), "threw kZEPStatusFail");
+  EXPECT_EQ(currentDirOfLength(3000), "threw kZEPStatusFail");
+}
+
+TEST(GetCurrentDirTest, ADirectoryThatIsGoneThrows) {
+  TTempDir const dir;
+  EXPECT_EQ(InChild([&] {
+              fs::create_directory(dir.Path("gone"));
+              fs::current_path(dir.Path("gone"));
+              fs::remove(dir.Path("gone"));
+              return TOSSpecific::GetCurrentDir();
+            }),
+            "threw kZEPStatusFail");
+}
+
+// ---- GetEnvironment and PutEnvironment ----
+
+TEST(EnvironmentTest, GetsTheValueOfAVariable) {
+  TEnvironmentGuard const full("ZEP_TEST_FULL", "a=b c"), empty("ZEP_TEST_EMPTY", "");
+  EXPECT_EQ(LogOf([] {
+              EXPECT_EQ(TOSSpecific::GetEnvironment("ZEP_TEST_FULL"), "a=b c");
+              EXPECT_EQ(TOSSpecific::GetEnvironment("ZEP_TEST_EMPTY"), "");
+            }),
+            TEntries{});
+}
+
+TEST(EnvironmentTest, AVariableThatIsNotSetIsEmptyAndLogged) {
+  TEnvironmentGuard const unset("ZEP_TEST_UNSET", nullptr);
+  for (char const* name : {"ZEP_TEST_UNSET", "", "PATH=x"})
+    EXPECT_EQ(LogOf([&] { EXPECT_EQ(TOSSpecific::GetEnvironment(name), ""); }),
+              (TEntries{"[Debug] TOSSpecific debug output: [ERROR]GetEnvironment:Cannt get environmnet."}));
+}
+
+TEST(EnvironmentTest, PutsAVariableInPlaceOfAnEarlierOne) {
+  TEnvironmentGuard const unset("ZEP_TEST_PUT", nullptr);
+  EXPECT_EQ(LogOf([] {
+              EXPECT_TRUE(TOSSpecific::PutEnvironment("ZEP_TEST_PUT", "first"));
+              EXPECT_EQ(TOSSpecific::GetEnvironment("ZEP_TEST_PUT"), "first");
+              EXPECT_TRUE(TOSSpecific::PutEnvironment("ZEP_TEST_PUT", "second=2"));
+              EXPECT_EQ(TOSSpecific::GetEnvironment("ZEP_TEST_PUT"), "second=2");
+              EXPECT_TRUE(TOSSpecific::PutEnvironment("ZEP_TEST_PUT", ""));
+              EXPECT_EQ(TOSSpecific::GetEnvironment("ZEP_TEST_PUT"), "");
+            }),
+            TEntries{});
+  EXPECT_STREQ(::getenv("ZEP_TEST_PUT"), "");
+}
+
+TEST(EnvironmentTest, ANameThatWillNotDoIsFalseAndLogged) {
+  for (char const* name : {"", "A=B", "="})
+    EXPECT_EQ(LogOf([&] { EXPECT_FALSE(TOSSpecific::PutEnvironment(name, "value")); }),
+              (TEntries{"[Debug] TOSSpecific debug output: [ERROR]PutEnvironment occured errors."}));
+}
+
+// ---- RelocateRelativePath ----
+
+TEST(RelocateRelativePathTest, PutsARelativePathBelowTheBase) {
+  struct TRow {
+    std::string base, path, result;
+  };
+  TRow const rows[] = {
+      {"/opt/a", "b/", "/opt/a/b"},
+      {"/opt/a", "b", "/opt/a/b"},
+      {"/opt/a/", "b", "/opt/a/b"},
+      {"/opt/a//", "b", "/opt/a//b"},
+      {"/opt/a", "b/c//", "/opt/a/b/c/"},  // one separator is taken off
+      {"/opt/a", "../b", "/opt/a/../b"},
+      {"/opt/a", "", "/opt/a/"},
+      {"/", "b", "/b"},
+      {"base", "b", "base/b"},
+      {"/opt/a", "/etc/x", "/etc/x"},
+      {"/opt/a", "/etc/x/", "/etc/x"},
+      {"/opt/a", "//", "/"},
+      {"/opt/a", "/", "/opt/a/"},  // the root is empty without its separator, and so counts as relative
+      {"", "b", "b"},
+      {"", "b/", "b"},
+      {"", "/etc/x/", "/etc/x"},
+      {"", "", ""},
+      {"", "/", ""},
+  };
+  for (TRow const& row : rows)
+    EXPECT_EQ(TOSSpecific::RelocateRelativePath(row.base, row.path), row.result) << row.base << " " << row.path;
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

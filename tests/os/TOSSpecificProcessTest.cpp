@@ -1,0 +1,585 @@
+#include "TOSSpecific.h"
+#include "tests/os/HostTools.h"
+#include "tests/os/Programs.h"
+
+#include <fcntl.h>
+#include <signal.h>
+#include <sys/mman.h>
+#include <sys/resource.h>
+#include <sys/stat.h>
+
+#include <atomic>
+#include <chrono>
+#include <map>
+
+namespace NQRVZEP20 {
+namespace {
+
+using TArguments = std::vector<std::string>;
+using TEntries = std::vector<std::string>;
+using namespace std::chrono_literals;
+
+constexpr int kForEver = -1;
+
+struct TRun {
+  int result;
+  std::string output;
+  std::chrono::milliseconds time;
+};
+
+// Runs a program of tests/os/children.
+TRun RunChild(std::string const& name, TArguments const& arguments = {}, int timeout = kForEver) {
+  TRun run;
+  auto const start = std::chrono::steady_clock::now();
+  run.result = TOSSpecific::SpawnProcess(Child(name), arguments, run.output, timeout);
+  run.time = std::chrono::duration_cast<std::chrono::milliseconds>(std::chrono::steady_clock::now() - start);
+  return run;
+}
+
+// Every child is to be waited for, except where a test says otherwise.
+class SpawnProcessTest : public testing::Test {
+protected:
+  void TearDown() override { EXPECT_FALSE(HasChildren()); }
+};
+
+// Ends the child that printed its number, and waits for it.
+void EndChild(std::string const& output) {
+  pid_t const child = std::stoi(output);
+  int status = 0;
+  ASSERT_GT(child, 0);
+  EXPECT_EQ(::waitpid(child, &status, WNOHANG), 0) << "the child should still run";
+  EXPECT_EQ(::kill(child, SIGKILL), 0);
+  EXPECT_EQ(::waitpid(child, &status, 0), child);
+}
+
+// ---- Results and output ----
+
+TEST_F(SpawnProcessTest, TellsOnlyWhetherTheChildExitedWithZero) {
+  struct TRow {
+    std::string child;
+    TArguments arguments;
+    int result;
+    std::string output;
+  };
+  TRow const rows[] = {
+      {"PrintsNothing", {}, 0, ""},
+      {"ExitsWith3", {}, -1, "done\n"},
+      {"PrintsToBoth", {}, 0, "out1 err1 out2 err2"},
+      {"PrintsAfterClosingStandardError", {}, 0, "error|output"},
+      {"DiesBySignal", {"9"}, -1, "last words"},
+      {"DiesBySignal", {"15"}, -1, "last words"},
+      {"LeavesAGrandchild", {}, 0, "child|grandchild"},
+      {"RunsOnAfterClosingItsOutput", {"0"}, 0, "closing"},
+      {"RunsOnAfterClosingItsOutput", {"4"}, -1, "closing"},
+      {"RunsOnAfterClosingItsOutput", {"256"}, 0, "closing"},
+      {"PrintsArguments", {"a", "", "b c", "*", "\"$HOME\""}, 0, "[" + Child("PrintsArguments") + "][a][][b c][*][\"$HOME\"]"},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.child);
+    TRun const run = RunChild(row.child, row.arguments);
+    EXPECT_EQ(run.result, row.result);
+    EXPECT_EQ(run.output, row.output);
+  }
+}
+
+TEST_F(SpawnProcessTest, AppendsToTheOutput) {
+  std::string output = "before|";
+  EXPECT_EQ(TOSSpecific::SpawnProcess(Child("ExitsWith3"), {}, output, kForEver), -1);
+  EXPECT_EQ(output, "before|done\n");
+  EXPECT_EQ(TOSSpecific::SpawnProcess(Child("PrintsNothing"), {}, output, kForEver), 0);
+  EXPECT_EQ(output, "before|done\n");
+  EXPECT_EQ(TOSSpecific::SpawnProcess(Child("PrintsToBoth"), {}, "child", {}, output, kForEver), 0);
+  EXPECT_EQ(output, "before|done\nout1 err1 out2 err2");
+}
+
+TEST_F(SpawnProcessTest, WaitsForTheLastHolderOfTheOutput) {
+  EXPECT_GE(RunChild("LeavesAGrandchild").time, 450ms);
+  EXPECT_GE(RunChild("RunsOnAfterClosingItsOutput", {"0"}).time, 250ms);
+}
+
+TEST_F(SpawnProcessTest, CapturesTwentyMegabytes) {
+  constexpr std::size_t kLength = 20 * 1000 * 1000;
+  TRun const run = RunChild("PrintsALot", {std::to_string(kLength)});
+  EXPECT_EQ(run.result, 0);
+  ASSERT_EQ(run.output.size(), kLength);
+  for (std::size_t i = 0; i < kLength; ++i)
+    if (run.output[i] != static_cast<char>('a' + i % 26000 % 26)) FAIL() << "wrong at " << i;
+}
+
+TEST_F(SpawnProcessTest, ZeroByteCutsOffTheRestOfItsChunk) {
+  EXPECT_EQ(RunChild("PrintsZeroByte").output, "before|next");
+  // 10000 bytes at once, the 101st of them zero: chunks of 4095, 4095 and 1810.
+  EXPECT_EQ(RunChild("PrintsZeroByteAmongMany").output, std::string(100 + 4095 + 1810, 'x'));
+}
+
+TEST_F(SpawnProcessTest, StandardInputIsTheCallers) {
+  TTempDir const dir;
+  WriteFile(dir.Path("input"), "typed");
+  int const old = ::dup(0), input = ::open(dir.Path("input").c_str(), O_RDONLY);
+  ::dup2(input, 0);
+  TRun const run = RunChild("EchoesItsInput");
+  ::dup2(old, 0);
+  ::close(old);
+  ::close(input);
+  EXPECT_EQ(run.output, "typed");
+}
+
+// ---- What is run ----
+
+TEST_F(SpawnProcessTest, ArgumentZeroAndEnvironmentAreThoseGiven) {
+  std::string output;
+  EXPECT_EQ(TOSSpecific::SpawnProcess(Child("PrintsArguments"), {"x", ""}, "another name", {}, output, kForEver), 0);
+  EXPECT_EQ(output, "[another name][x][]");
+
+  output.clear();
+  EXPECT_EQ(TOSSpecific::SpawnProcess(Child("PrintsEnvironment"), {}, "", {"A=1", "B=", "no equals"}, output, kForEver), 0);
+  EXPECT_EQ(output, "[A=1][B=][no equals]");
+
+  output.clear();
+  EXPECT_EQ(TOSSpecific::SpawnProcess(Child("PrintsEnvironment"), {}, "", {}, output, kForEver), 0);
+  EXPECT_EQ(output, "");
+}
+
+TEST_F(SpawnProcessTest, EnvironmentIsTheCallersWhereNoneIsGiven) {
+  TEnvironmentGuard const variable("ZEP_TEST_VARIABLE", "seen by the child");
+  EXPECT_NE(RunChild("PrintsEnvironment").output.find("[ZEP_TEST_VARIABLE=seen by the child]"), std::string::npos);
+}
+
+TEST_F(SpawnProcessTest, OnlyTheFormWithoutEnvironmentSearchesThePath) {
+  TEnvironmentGuard const path("PATH", ZEP_CHILDREN_DIR);
+  std::string output;
+  EXPECT_EQ(TOSSpecific::SpawnProcess("PrintsArguments", {"a"}, output, kForEver), 0);
+  EXPECT_EQ(output, "[PrintsArguments][a]");
+  output.clear();
+  EXPECT_EQ(
+      TOSSpecific::SpawnProcess("PrintsArguments", {"a"}, "name", {std::string("PATH=") + ZEP_CHILDREN_DIR}, output, kForEver),
+      -1);
+  EXPECT_EQ(output, "");
+}
+
+TEST_F(SpawnProcessTest, SearchGoesOnAfterADirectoryWithoutTheProgram) {
+  TTempDir const dir;
+  WriteFile(dir.Path("PrintsArguments"), "not executable");
+  TEnvironmentGuard const path("PATH", ("/nonexistent:" + dir.Path() + ":" ZEP_CHILDREN_DIR).c_str());
+  EXPECT_EQ(TOSSpecific::SpawnProcess("PrintsArguments", {}, kForEver), "[PrintsArguments]");
+}
+
+TEST_F(SpawnProcessTest, AScriptWithoutItsInterpreterRunsInTheShellWhereThePathIsSearched) {
+  TTempDir const dir;
+  WriteFile(dir.Path("script"), "echo \"$0\" \"$1\"\n");
+  ::chmod(dir.Path("script").c_str(), 0755);
+  std::string output;
+  EXPECT_EQ(TOSSpecific::SpawnProcess(dir.Path("script"), {"one"}, output, kForEver), 0);
+  EXPECT_EQ(output, dir.Path("script") + " one\n");
+  output.clear();
+  EXPECT_EQ(TOSSpecific::SpawnProcess(dir.Path("script"), {"one"}, "script", {}, output, kForEver), -1);
+  EXPECT_EQ(output, "");
+}
+
+TEST_F(SpawnProcessTest, AProgramThatCannotBeExecutedIsMinusOneAndNoException) {
+  TTempDir const dir;
+  WriteFile(dir.Path("file"), "text");
+  for (std::string const& program : {std::string("/nonexistent"), std::string("nonexistent-program"), dir.Path("file"),
+                                     dir.Path(), std::string(), std::string(5000, 'x'), "/" + std::string(5000, 'x')}) {
+    SCOPED_TRACE(program.substr(0, 40));
+    std::string output;
+    EXPECT_EQ(LogOf([&] { EXPECT_EQ(TOSSpecific::SpawnProcess(program, {"a"}, output, kForEver), -1); }),
+              (TEntries{"[Debug] SpawnProcess: process " + program}));
+    EXPECT_EQ(TOSSpecific::SpawnProcess(program, {"a"}, "name", {}, output, kForEver), -1);
+    EXPECT_EQ(output, "");
+  }
+}
+
+TEST_F(SpawnProcessTest, ManyAndLongArgumentsArriveWhole) {
+  TArguments arguments;
+  std::string expected = "[" + Child("PrintsArguments") + "]";
+  for (int i = 0; i < 2000; ++i) {
+    arguments.push_back(std::string(static_cast<std::size_t>(i % 100), 'x'));
+    expected += "[" + arguments.back() + "]";
+  }
+  EXPECT_EQ(RunChild("PrintsArguments", arguments).output, expected);
+}
+
+TEST_F(SpawnProcessTest, StringFormReturnsTheOutputWhateverTheResult) {
+  EXPECT_EQ(TOSSpecific::SpawnProcess(Child("ExitsWith3"), TArguments{}, kForEver), "done\n");
+  EXPECT_EQ(TOSSpecific::SpawnProcess(Child("PrintsArguments"), TArguments{"a b"}, kForEver),
+            "[" + Child("PrintsArguments") + "][a b]");
+  EXPECT_EQ(TOSSpecific::SpawnProcess("/nonexistent", TArguments{}, kForEver), "");
+}
+
+TEST_F(SpawnProcessTest, CommandLineIsCutAtEverySingleBlank) {
+  std::string const name = Child("PrintsArguments");
+  struct TRow {
+    std::string commandLine, output;
+  };
+  TRow const rows[] = {
+      {name, ""},
+      {name + " a", "[a]"},
+      {name + " a b", "[a][b]"},
+      {name + "  a", "[][a]"},
+      {name + " a   b", "[a][][][b]"},
+      {name + " ", "[]"},
+      {name + " a ", "[a][]"},
+      {name + " 'a b' \"c\" \\ d", "['a][b'][\"c\"][\\][d]"},
+      {name + " a\tb\nc", "[a\tb\nc]"},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.commandLine);
+    EXPECT_EQ(TOSSpecific::SpawnProcess(row.commandLine, kForEver), "[" + name + "]" + row.output);
+  }
+  EXPECT_EQ(TOSSpecific::SpawnProcess(" " + name, kForEver), "");  // an empty program
+  EXPECT_EQ(TOSSpecific::SpawnProcess("", kForEver), "");
+}
+
+// ---- Messages ----
+
+TEST_F(SpawnProcessTest, LogsWhatItCalls) {
+  std::string output;
+  EXPECT_EQ(LogOf([&] {
+              TOSSpecific::SpawnProcess(Child("PrintsNothing"), {"a", "", "b c"}, "zero", {"A=1", "B=2"}, output, kForEver);
+            }),
+            (TEntries{"[Debug] TOSSpecific::SpawnProcess calling " + Child("PrintsNothing") +
+                      "\nwith parameters zero a  b c \nwith envoirment vars A=1 B=2 "}));
+  EXPECT_EQ(LogOf([&] { TOSSpecific::SpawnProcess(Child("PrintsNothing"), {}, "", {}, output, kForEver); }),
+            (TEntries{"[Debug] TOSSpecific::SpawnProcess calling " + Child("PrintsNothing") +
+                      "\nwith parameters  \nwith envoirment vars "}));
+  EXPECT_EQ(LogOf([&] { RunChild("PrintsNothing", {"a"}); }),
+            (TEntries{"[Debug] SpawnProcess: process " + Child("PrintsNothing")}));
+  EXPECT_EQ(LogOf([&] { RunChild("ExitsWith3"); }), (TEntries{"[Debug] SpawnProcess: process " + Child("ExitsWith3")}));
+}
+
+TEST_F(SpawnProcessTest, AChildEndedByASignalIsLogged) {
+  EXPECT_EQ(LogOf([] { EXPECT_EQ(RunChild("DiesBySignal", {"9"}).result, -1); }),
+            (TEntries{"[Debug] SpawnProcess: process " + Child("DiesBySignal"),
+                      "[Debug] ERROR: SpawnProcess - Child process exited abnormally!"}));
+}
+
+// ---- The time-out ----
+
+TEST_F(SpawnProcessTest, TimeoutIsOneOfSilenceAndLeavesTheChildAlive) {
+  TRun run;
+  EXPECT_EQ(LogOf([&] { run = RunChild("StaysSilent", {}, 1); }),
+            (TEntries{"[Debug] SpawnProcess: process " + Child("StaysSilent"),
+                      "[Debug] ERROR: SpawnProcess - " + Child("StaysSilent") + " TimeOut!"}));
+  EXPECT_EQ(run.result, -1);
+  EXPECT_GE(run.time, 990ms);
+  EXPECT_LT(run.time, 15s);
+  EndChild(run.output);  // what came before the silence stays in the output
+}
+
+TEST_F(SpawnProcessTest, TimeoutOfTheFormWithEnvironmentNamesItsPath) {
+  std::string output;
+  TEntries const entries =
+      LogOf([&] { EXPECT_EQ(TOSSpecific::SpawnProcess(Child("StaysSilent"), {}, "zero", {}, output, 1), -1); });
+  ASSERT_EQ(entries.size(), 2u);
+  EXPECT_EQ(entries[1], "[Debug] ERROR: SpawnProcess - " + Child("StaysSilent") + " TimeOut!");
+  EndChild(output);
+}
+
+TEST_F(SpawnProcessTest, TimeoutOfZeroAllowsNoSilenceAtAll) {
+  std::string output;
+  EXPECT_EQ(RunChild("TalksSlowly", {"300", "1"}, 0).result, -1);
+  EXPECT_GT(::wait(nullptr), 0);
+}
+
+TEST_F(SpawnProcessTest, AChildThatKeepsTalkingIsNeverTimedOut) {
+  TRun const run = RunChild("TalksSlowly", {"700", "4"}, 2);
+  EXPECT_EQ(run.result, 0);
+  EXPECT_EQ(run.output, "....");
+  EXPECT_GE(run.time, 2700ms);
+}
+
+TEST_F(SpawnProcessTest, TimeoutOfMinusOneWaitsForEver) {
+  TRun const run = RunChild("TalksSlowly", {"1500", "1"}, kForEver);
+  EXPECT_EQ(run.result, 0);
+  EXPECT_GE(run.time, 1450ms);
+}
+
+TEST_F(SpawnProcessTest, AnyOtherNegativeTimeoutIsAFailureOfSelect) {
+  TRun run;
+  EXPECT_EQ(
+      LogOf([&] { run = RunChild("PrintsNothing", {}, -2); }),
+      (TEntries{"[Debug] SpawnProcess: process " + Child("PrintsNothing"), "[Debug] ERROR: SpawnProcess - select call failed!"}));
+  EXPECT_EQ(run.result, -1);
+  EXPECT_GT(::wait(nullptr), 0);  // nor is it waited for
+}
+
+// ---- Signals ----
+
+void Ignored(int) {}
+
+// Handles SIGUSR1 in that way; afterwards as before.
+class TSignalAction {
+public:
+  explicit TSignalAction(void (*handler)(int), int number = SIGUSR1) : fNumber(number) {
+    struct sigaction action {};
+    action.sa_handler = handler;
+    ::sigaction(number, &action, &fOld);
+  }
+  ~TSignalAction() { ::sigaction(fNumber, &fOld, nullptr); }
+
+private:
+  int fNumber;
+  struct sigaction fOld;
+};
+
+TEST_F(SpawnProcessTest, AnInterruptedSelectIsNotRetried) {
+  TSignalAction const action(Ignored);
+  TRun run;
+  EXPECT_EQ(
+      LogOf([&] {
+        std::atomic<bool> done{false};
+        std::thread interrupter([&done, spawner = ::pthread_self()] {
+          std::this_thread::sleep_for(1s);
+          while (!done) {
+            ::pthread_kill(spawner, SIGUSR1);
+            std::this_thread::sleep_for(100ms);
+          }
+        });
+        run = RunChild("StaysSilent");
+        done = true;
+        interrupter.join();
+      }),
+      (TEntries{"[Debug] SpawnProcess: process " + Child("StaysSilent"), "[Debug] ERROR: SpawnProcess - select call failed!"}));
+  EXPECT_EQ(run.result, -1);
+  EndChild(run.output);
+}
+
+TEST_F(SpawnProcessTest, SignalStateIsThatOfForkAndExec) {
+  TSignalAction const caught(Ignored, SIGUSR1), ignored(SIG_IGN, SIGUSR2);
+  EXPECT_EQ(RunChild("PrintsSignals").output, "open,default;open,ignored;");
+
+  sigset_t both, old;
+  ::sigemptyset(&both);
+  ::sigaddset(&both, SIGUSR1);
+  ::sigaddset(&both, SIGUSR2);
+  ::pthread_sigmask(SIG_BLOCK, &both, &old);
+  EXPECT_EQ(RunChild("PrintsSignals").output, "blocked,default;blocked,ignored;");
+  ::pthread_sigmask(SIG_SETMASK, &old, nullptr);
+}
+
+TEST_F(SpawnProcessTest, SignalStateOfTheCallerStaysAsItWas) {
+  TSignalAction const caught(Ignored, SIGUSR1);
+  sigset_t one, before, after;
+  ::sigemptyset(&one);
+  ::sigaddset(&one, SIGUSR2);
+  ::pthread_sigmask(SIG_BLOCK, &one, &before);
+  RunChild("PrintsNothing");
+  TOSSpecific::SpawnProcess("/nonexistent", kForEver);
+  struct sigaction action;
+  ::sigaction(SIGUSR1, nullptr, &action);
+  EXPECT_EQ(action.sa_handler, &Ignored);
+  ::pthread_sigmask(SIG_SETMASK, &before, &after);
+  for (int number = 1; number < 32; ++number)
+    EXPECT_EQ(::sigismember(&after, number), number == SIGUSR2 ? 1 : ::sigismember(&before, number)) << number;
+}
+
+TEST_F(SpawnProcessTest, AChildThatNobodyWaitsForIsAFailureOfWaitpid) {
+  TSignalAction const action(SIG_IGN, SIGCHLD);  // the kernel takes the child's status itself
+  EXPECT_EQ(
+      LogOf([] { EXPECT_EQ(RunChild("ExitsWith3").output, "done\n"); }),
+      (TEntries{"[Debug] SpawnProcess: process " + Child("ExitsWith3"), "[Debug] ERROR: SpawnProcess - waitpid call failed!"}));
+}
+
+// ---- Descriptors ----
+
+// The descriptors of this process above standard error that exec leaves open, as PrintsDescriptors prints its own.
+std::string InheritableDescriptors() {
+  std::map<int, std::string> names;
+  for (auto const& entry : std::filesystem::directory_iterator("/proc/self/fd")) {
+    int const fd = std::stoi(entry.path().filename());
+    int const flags = ::fcntl(fd, F_GETFD);
+    std::error_code gone;
+    if (fd > 2 && flags != -1 && (flags & FD_CLOEXEC) == 0) names[fd] = std::filesystem::read_symlink(entry, gone);
+  }
+  std::string text;
+  for (auto const& [fd, name] : names) text += std::to_string(fd) + " " + name + "\n";
+  return text;
+}
+
+TEST_F(SpawnProcessTest, ChildInheritsTheCallersDescriptorsAndNotItsPipe) {
+  TTempDir const dir;
+  WriteFile(dir.Path("inherited"), "");
+  WriteFile(dir.Path("closed"), "");
+  int const inherited = ::open(dir.Path("inherited").c_str(), O_RDONLY);
+  int const closed = ::open(dir.Path("closed").c_str(), O_RDONLY | O_CLOEXEC);
+  std::string const expected = InheritableDescriptors();
+  std::string const descriptors = RunChild("PrintsDescriptors").output;
+  ::close(inherited);
+  ::close(closed);
+  EXPECT_EQ(descriptors, expected);
+  EXPECT_NE(descriptors.find(std::to_string(inherited) + " " + dir.Path("inherited") + "\n"), std::string::npos) << descriptors;
+}
+
+TEST_F(SpawnProcessTest, PipeOfAnotherThreadIsInherited) {
+  std::string const before = InheritableDescriptors();
+  int const count = OpenDescriptors();
+  std::thread other([] { RunChild("TalksSlowly", {"1500", "1"}); });
+  while (OpenDescriptors() != count + 1) std::this_thread::sleep_for(5ms);  // the read end of its pipe
+  std::string const during = InheritableDescriptors(), descriptors = RunChild("PrintsDescriptors").output;
+  other.join();
+  EXPECT_NE(during, before);
+  EXPECT_EQ(descriptors, during);
+}
+
+TEST_F(SpawnProcessTest, OutputIsCapturedAlsoWhereTheStandardDescriptorsAreClosed) {
+  for (std::vector<int> const& closed : std::vector<std::vector<int>>{{0}, {1}, {2}, {0, 1}, {1, 2}, {0, 1, 2}}) {
+    SCOPED_TRACE(testing::PrintToString(closed));
+    EXPECT_EQ(InChild([&] {
+                for (int const fd : closed) ::close(fd);
+                TRun const run = RunChild("PrintsToBoth");
+                return std::to_string(run.result) + " " + run.output;
+              }),
+              "0 out1 err1 out2 err2");
+  }
+}
+
+TEST_F(SpawnProcessTest, AReadEndThatSelectCannotWatchIsAFailureOfSelectAndNothingIsRun) {
+  TTempDir const dir;
+  rlimit limit;
+  ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &limit), 0);
+  NEEDS(limit.rlim_max >= 2048, "leave to open 2048 files");
+  rlimit const more{2048, limit.rlim_max};
+  ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &more), 0);
+  std::vector<int> open{::open("/dev/null", O_RDONLY)};
+  std::string output;
+  TEntries const entries = LogOf([&] {
+    while (open.back() < FD_SETSIZE - 1) open.push_back(::open("/dev/null", O_RDONLY));  // the log has its file by now
+    EXPECT_EQ(TOSSpecific::SpawnProcess(Child("WritesAFile"), {dir.Path("run"), "x"}, output, kForEver), -1);
+  });
+  // Now 1023 for the read end, which select can watch, and 1024 for the write end.
+  ::close(open.back());
+  open.pop_back();
+  TRun const last = RunChild("PrintsToBoth");
+  for (int const fd : open) ::close(fd);
+  ::setrlimit(RLIMIT_NOFILE, &limit);
+  EXPECT_EQ(entries, (TEntries{"[Debug] SpawnProcess: process " + Child("WritesAFile"),
+                               "[Debug] ERROR: SpawnProcess - select call failed!"}));
+  EXPECT_EQ(output, "");
+  EXPECT_FALSE(std::filesystem::exists(dir.Path("run")));
+  EXPECT_EQ(last.result, 0);
+  EXPECT_EQ(last.output, "out1 err1 out2 err2");
+}
+
+TEST_F(SpawnProcessTest, WithoutDescriptorsForAPipeItIsMinusOneAndLogged) {
+  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs descriptors of its own";
+  TEntries const entries = LogOf([] {
+    int const lowest = ::dup(0);
+    ::close(lowest);
+    rlimit limit;
+    ::getrlimit(RLIMIT_NOFILE, &limit);
+    rlimit const none{static_cast<rlim_t>(lowest), limit.rlim_max};
+    ::setrlimit(RLIMIT_NOFILE, &none);
+    std::string output;
+    int const result = TOSSpecific::SpawnProcess(Child("PrintsToBoth"), {}, output, kForEver);
+    ::setrlimit(RLIMIT_NOFILE, &limit);
+    EXPECT_EQ(result, -1);
+    EXPECT_EQ(output, "");
+  });
+  EXPECT_EQ(entries, (TEntries{"[Debug] SpawnProcess: process " + Child("PrintsToBoth"),
+                               "[Debug] ERROR: SpawnProcess - pipe call failed!"}));
+}
+
+TEST_F(SpawnProcessTest, LeavesNoDescriptorOpen) {
+  int const before = OpenDescriptors();
+  RunChild("PrintsToBoth");
+  RunChild("DiesBySignal", {"9"});
+  TOSSpecific::SpawnProcess("/nonexistent", kForEver);
+  EXPECT_EQ(OpenDescriptors(), before);
+  std::string output;
+  TOSSpecific::SpawnProcess(Child("StaysSilent"), {}, output, 1);
+  EXPECT_EQ(OpenDescriptors(), before);
+  EndChild(output);
+}
+
+// ---- The start of the child ----
+
+TEST_F(SpawnProcessTest, WhereNoProcessCanBeMadeItThrows) {
+  // In a child, as a user that may have no further process.
+  auto const spawnWithoutProcesses = [](auto spawn) {
+    return InChild([&] {
+      TLogger::GetInstance()->ClearLog();
+      rlimit const none{0, 0};
+      if (!BecomeUnprivileged() || ::setrlimit(RLIMIT_NPROC, &none) != 0) return std::string("not prepared");
+      int const before = OpenDescriptors();
+      std::string result;
+      try {
+        result = spawn();
+      } catch (TZEPException const& thrown) {
+        result = thrown.what();
+      }
+      for (auto const& entry : TLogger::GetInstance()->GetLog())
+        result += " " + std::to_string(entry.fSeverity) + ":" + entry.fMessage;
+      if (OpenDescriptors() != before) result += " and descriptors left";
+      return result;
+    });
+  };
+  std::string const failure = "kZEPStatusFail 0:ERROR: Fork failed";
+  std::string output;
+  EXPECT_EQ(spawnWithoutProcesses([&] { return std::to_string(TOSSpecific::SpawnProcess("true", {}, output, kForEver)); }),
+            failure);
+  EXPECT_EQ(
+      spawnWithoutProcesses([&] { return std::to_string(TOSSpecific::SpawnProcess("/bin/true", {}, "", {}, output, kForEver)); }),
+      failure);
+  EXPECT_EQ(spawnWithoutProcesses([&] { return TOSSpecific::SpawnProcess("true", TArguments{}, kForEver); }), failure);
+  EXPECT_EQ(spawnWithoutProcesses([&] { return TOSSpecific::SpawnProcess("true", kForEver); }), failure);
+}
+
+// After a fork, each page of the caller costs a fault at its next write; and the time of the fork grows with their number.
+TEST_F(SpawnProcessTest, TheCallersMemoryIsNotCopied) {
+  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which may fork instead";
+  constexpr std::size_t kPages = 20000, kPageSize = 4096;
+  void* const memory = ::mmap(nullptr, kPages * kPageSize, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+  ASSERT_NE(memory, MAP_FAILED);
+  ::madvise(memory, kPages * kPageSize, MADV_NOHUGEPAGE);
+  auto const touch = [&] {
+    for (std::size_t page = 0; page < kPages; ++page) static_cast<char volatile*>(memory)[page * kPageSize] = 1;
+  };
+  auto const faults = [] {
+    rusage usage;
+    ::getrusage(RUSAGE_SELF, &usage);
+    return usage.ru_minflt;
+  };
+  touch();
+  RunChild("PrintsNothing");
+  long const before = faults();
+  touch();
+  long const after = faults();
+  ::munmap(memory, kPages * kPageSize);
+  EXPECT_LT(after - before, static_cast<long>(kPages / 10));
+}
+
+TEST_F(SpawnProcessTest, ServesManyThreads) {
+  std::atomic<int> wrong{0};
+  std::vector<std::thread> threads;
+  for (int i = 0; i < 8; ++i)
+    threads.emplace_back([&wrong, i] {
+      for (int round = 0; round < 25; ++round) {
+        TRun const run = RunChild("PrintsArguments", {std::to_string(i), std::to_string(round)});
+        std::string const expected =
+            "[" + Child("PrintsArguments") + "][" + std::to_string(i) + "][" + std::to_string(round) + "]";
+        if (run.result != 0 || run.output != expected) ++wrong;
+      }
+    });
+  for (std::thread& thread : threads) thread.join();
+  EXPECT_EQ(wrong, 0);
+}
+
+// ---- A thousand times ----
+
+class SpawnAThousandTimesTest : public testing::TestWithParam<char const*> {};
+
+TEST_P(SpawnAThousandTimesTest, LeavesNothingBehind) {
+  TProgramRun const run = RunProgram(std::string(ZEP_BUILD_DIR "/tests/programs/SpawnsAThousandTimes ") + GetParam());
+  EXPECT_EQ(run.exitCode, 0);  // also without what a sanitizer for leaks would find
+  EXPECT_EQ(run.output, "0 descriptors, no children, 0 bytes\n");
+}
+
+INSTANTIATE_TEST_SUITE_P(Forms, SpawnAThousandTimesTest,
+                         testing::Values("PathAndEnvironment", "SearchedProgram", "StringOfAProgram", "CommandLine",
+                                         "NoSuchProgram", "ProgramThatFails", "ProgramThatDies", "TimedOut", "CapFileViaProc",
+                                         "FindFile"),
+                         [](auto const& form) { return form.param; });
+
+}  // namespace
+}  // namespace NQRVZEP20

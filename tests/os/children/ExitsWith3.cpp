@@ -1,0 +1,7 @@
+// Prints one line and exits with 3.
+#include <cstdio>
+
+int main() {
+  std::puts("done");
+  return 3;
+}

@@ -1,0 +1,8 @@
+// Prints a chunk with a zero byte in it, and later, as a chunk of its own, one without.
+#include <unistd.h>
+
+int main() {
+  if (::write(1, "before\0after", 12) != 12) return 1;
+  ::usleep(300000);
+  return ::write(1, "|next", 5) == 5 ? 0 : 1;
+}

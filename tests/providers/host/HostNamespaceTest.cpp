@@ -1,0 +1,262 @@
+// The namespace that the provider fills, read as a front end reads it.
+
+#include "providers/host/HostNamespace.h"
+
+#include "ICIMClass.h"
+#include "ICIMInstance.h"
+#include "ICIMProperty.h"
+#include "ICIMPropertyDecl.h"
+#include "ICIMQualifier.h"
+#include "TAddToVectorCallback.h"
+#include "TCIMSchemaHelper.h"
+#include "TNamespaceProviderManager.h"
+#include "TOSSpecific.h"
+#include "providers/memory/TMemoryNamespace.h"
+#include "tests/SmbiosTables.h"
+#include "tests/providers/host/Structures.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <boost/make_shared.hpp>
+
+#include <functional>
+
+namespace NQRVZEP20 {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+using testing::UnorderedElementsAre;
+
+using TInstances = std::vector<boost::shared_ptr<ICIMInstance>>;
+
+class HostNamespaceTest : public testing::Test {
+protected:
+  void FillFromFile(std::string const& path) {
+    TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", path.c_str());
+    TEnvironmentGuard const name("ZEP_HOST_NAME", "db1");
+    ns_ = boost::make_shared<TMemoryNamespace>("root/test");
+    FillHostNamespace(*ns_);
+  }
+  void Fill(std::string const& table) {
+    WriteFile(dir_.Path("table"), table);
+    FillFromFile(dir_.Path("table"));
+  }
+
+  TInstances InstancesOf(std::string const& className) {
+    TInstances instances;
+    ns_->GetClass(className, TCIMContext())->EnumerateInstances(TAddToVectorCallback<ICIMInstance>(instances), TCIMContext());
+    return instances;
+  }
+
+  static std::string TextOf(ICIMInstance const& instance, std::string const& property) {
+    TCIMValue const value = instance.GetProperty(property, TCIMContext())->GetValue(TCIMContext());
+    return value.IsNull() ? "NULL" : value.ToString();
+  }
+  std::string TextOfOnly(std::string const& className, std::string const& property) {
+    TInstances const instances = InstancesOf(className);
+    EXPECT_EQ(instances.size(), 1u) << className;
+    return TextOf(*instances.at(0), property);
+  }
+
+  // "path property: code" of each value that is missing from instances of the class, or of the whole class.
+  std::vector<std::string> MissingOf(std::string const& className) {
+    std::vector<std::string> missing;
+    for (auto const& instance : InstancesOf("ZEP_MissingValue"))
+      if (TextOf(*instance, "ElementPath").compare(0, className.size(), className) == 0)
+        missing.push_back(TextOf(*instance, "ElementProperty") + ": " + TextOf(*instance, "Reason"));
+    return missing;
+  }
+
+  TTempDir dir_;
+  boost::shared_ptr<TMemoryNamespace> ns_;
+};
+
+// The value, or the status that is thrown.
+std::string Asked(std::function<std::string()> const& ask) {
+  try {
+    return ask();
+  } catch (TZEPException const& thrown) {
+    return thrown.what();
+  }
+}
+
+TEST_F(HostNamespaceTest, TheSchemaHelperReadsTheRealTables) {
+  struct TRow {
+    char const *table, *product, *mtm, *serial;
+  } const rows[] = {
+      {"full", "Server Q100 -[1234AB7]-", "1234AB7", "KQ12345"},
+      {"bare7", "1234AB7", "1234AB7", "KQ12345"},
+      {"eight", "1234AB78", "kZEPStatusInvalidFormat", "KQ12345"},
+      {"no-serial", "Server-[5678XY1]-", "5678XY1", "kZEPStatusNotFound"},
+      {"two-dashes", "Rack-Server Q200 -[5678XY1]-", "5678XY1", "kZEPStatusInvalidFormat"},
+      {"qemu-own", "Standard PC (i440FX + PIIX, 1996)", "kZEPStatusInvalidFormat", "kZEPStatusNotFound"},
+      {"entry64", "Server Q100 -[1234AB7]-", "1234AB7", "KQ12345"},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.table);
+    FillFromFile(RealTablePath(row.table));
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSystemProductName(ns_); }), row.product);
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetMTM(ns_); }), row.mtm);
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSerialNumber(ns_, TCIMContext()); }), row.serial);
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSystemName(ns_); }), "db1");
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetDataSourceVersion(ns_, TCIMContext()); }), TEST_VERSION);
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetDataSourceBuild(ns_, TCIMContext()); }), TEST_BUILD_ID);
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetOperatingSystemType(ns_); }), "Linux");
+  }
+}
+
+TEST_F(HostNamespaceTest, TheSampleIsReadWhole) {
+  FillFromFile(SamplePath());
+  EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "UUID"), "6F1D2C3B-4A59-4687-9708-1A2B3C4D5E6F");
+  EXPECT_EQ(TextOfOnly("CIM_BIOSElement", "Version"), "-[QAE118B-1.30]-");
+  EXPECT_EQ(TextOfOnly("CIM_Chassis", "Height"), "3.5");
+  ASSERT_EQ(InstancesOf("CIM_Processor").size(), 2u);
+  EXPECT_EQ(TextOf(*InstancesOf("CIM_Processor")[1], "Name"), "CPU 2");
+  EXPECT_EQ(TextOf(*InstancesOf("CIM_Processor")[1], "DeviceID"), "Processor 1");
+  ASSERT_EQ(InstancesOf("CIM_PhysicalMemory").size(), 8u);
+  EXPECT_EQ(TextOf(*InstancesOf("CIM_PhysicalMemory")[7], "ElementName"), "CPU 2 DIMM 4");
+  EXPECT_EQ(TextOf(*InstancesOf("CIM_PhysicalMemory")[7], "Capacity"), "17179869184");
+}
+
+TEST_F(HostNamespaceTest, ClassesComeInAFixedOrder) {
+  FillFromFile(SamplePath());
+  std::vector<std::string> names;
+  ns_->EnumerateClasses(
+      [&](boost::shared_ptr<ICIMClass> cls) {
+        names.push_back(cls->GetName(TCIMContext()));
+        return true;
+      },
+      TCIMContext());
+  EXPECT_THAT(names, ElementsAre("QRVSG_ComputerSystem", "QRVSG_OperatingSystem", "QRVSG_ZEPProduct", "CIM_BIOSElement",
+                                 "CIM_Chassis", "CIM_Processor", "CIM_PhysicalMemory", "ZEP_MissingValue"));
+}
+
+TEST_F(HostNamespaceTest, ADeclarationTellsKeyTypeAndSource) {
+  FillFromFile(SamplePath());
+  auto const cls = ns_->GetClass("QRVSG_ComputerSystem", TCIMContext());
+  auto const source = [&](char const* property) {
+    auto const qualifier = cls->GetPropertyDecl(property, TCIMContext())->GetQualifier("ValueSource", TCIMContext());
+    return qualifier ? qualifier->GetValue(TCIMContext()).ToString() : "none";
+  };
+  EXPECT_EQ(source("SerialNumber"), "SMBIOS type 1 (file)");
+  EXPECT_EQ(source("Name"), "ZEP_HOST_NAME");
+  EXPECT_EQ(source("CreationClassName"), "none");
+  EXPECT_TRUE(cls->GetPropertyDecl("Name", TCIMContext())->IsKey(TCIMContext()));
+  EXPECT_FALSE(cls->GetPropertyDecl("SerialNumber", TCIMContext())->IsKey(TCIMContext()));
+  EXPECT_EQ(
+      ns_->GetClass("CIM_PhysicalMemory", TCIMContext())->GetPropertyDecl("Capacity", TCIMContext())->GetType(TCIMContext()),
+      TCIMValue::TCIMType::kCIMTypeUint64);
+}
+
+TEST_F(HostNamespaceTest, EveryInstanceIsFoundByItsPath) {
+  FillFromFile(SamplePath());
+  int found = 0;
+  ns_->EnumerateClasses(
+      [&](boost::shared_ptr<ICIMClass> cls) {
+        for (auto const& instance : InstancesOf(cls->GetName(TCIMContext()))) {
+          std::string const path = "root/test:" + instance->GetPath(TCIMContext()).GetPath();
+          EXPECT_EQ(TCIMReference(ns_, path, TCIMContext()).GetCIMElement(false), instance) << path;
+          ++found;
+        }
+        return true;
+      },
+      TCIMContext());
+  EXPECT_EQ(found, 17);  // 1 of each single class, 2 processors, 8 modules and 2 values that are missing
+}
+
+TEST_F(HostNamespaceTest, EachMissingValueOfAnInstanceSaysWhy) {
+  FillFromFile(RealTablePath("no-serial"));
+  EXPECT_THAT(MissingOf("QRVSG_ComputerSystem."),
+              UnorderedElementsAre("SerialNumber: the firmware gives no text", "UUID: the firmware gives none (all zeros)",
+                                   "SKUNumber: the firmware gives no text", "Family: the firmware gives no text"));
+}
+
+TEST_F(HostNamespaceTest, NothingIsNullWithoutAReason) {
+  for (std::string const& table : kRealTables) {
+    SCOPED_TRACE(table);
+    FillFromFile(RealTablePath(table));
+    int nulls = 0;
+    for (char const* className : {"QRVSG_ComputerSystem", "QRVSG_OperatingSystem", "QRVSG_ZEPProduct", "CIM_BIOSElement",
+                                  "CIM_Chassis", "CIM_Processor", "CIM_PhysicalMemory"})
+      for (auto const& instance : InstancesOf(className))
+        instance->EnumerateProperties(
+            [&](boost::shared_ptr<ICIMProperty> property) {
+              nulls += property->GetValue(TCIMContext()).IsNull();
+              return true;
+            },
+            TCIMContext());
+    auto const missing = InstancesOf("ZEP_MissingValue");
+    EXPECT_EQ(missing.size(), static_cast<std::size_t>(nulls));
+    EXPECT_GT(nulls, 0);
+    for (auto const& instance : missing) {
+      EXPECT_NE(TextOf(*instance, "Reason"), "");
+      EXPECT_NE(TextOf(*instance, "Code"), "");
+    }
+  }
+}
+
+TEST_F(HostNamespaceTest, WithoutTablesTheMachineStillHasANameAndASystem) {
+  FillFromFile(dir_.Path("nothing"));
+  std::string const reason = "the SMBIOS table file " + dir_.Path("nothing") + " does not exist";
+  EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "Name"), "db1");
+  EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "SerialNumber"), "NULL");
+  EXPECT_EQ(TextOfOnly("QRVSG_OperatingSystem", "OSType"), "Linux");
+  for (char const* className : {"CIM_BIOSElement", "CIM_Chassis", "CIM_Processor", "CIM_PhysicalMemory"}) {
+    SCOPED_TRACE(className);
+    EXPECT_THAT(InstancesOf(className), IsEmpty());
+    EXPECT_THAT(MissingOf(className), ElementsAre(": " + reason));
+  }
+  EXPECT_EQ(MissingOf("QRVSG_ComputerSystem.").size(), 7u);
+}
+
+TEST_F(HostNamespaceTest, EmptySocketsAndSlotsHaveNoInstance) {
+  Fill(TStructureMaker(4, 0x30).Text(0x04, "CPU 1").Table() +
+       TStructureMaker(4, 0x30).Text(0x04, "CPU 2").Byte(0x18, 0x41).Table() +
+       TStructureMaker(17, 0x22).Text(0x10, "DIMM 1").Table() + EndOfTable());
+  EXPECT_EQ(TextOfOnly("CIM_Processor", "Name"), "CPU 2");
+  EXPECT_EQ(TextOfOnly("CIM_Processor", "DeviceID"), "Processor 0");
+  EXPECT_THAT(InstancesOf("CIM_PhysicalMemory"), IsEmpty());
+  EXPECT_THAT(MissingOf("CIM_PhysicalMemory"), ElementsAre(": the firmware calls every memory slot empty"));
+  EXPECT_THAT(MissingOf("CIM_Chassis"), ElementsAre(": the SMBIOS tables hold no structure of type 3 (Chassis)"));
+}
+
+TEST_F(HostNamespaceTest, AKeyThatTheFirmwareDoesNotGiveIsLeftOutOfThePath) {
+  std::string const bios = TStructureMaker(0, 0x18).Text(0x04, "Example Works").Table();
+  Fill(bios + bios + EndOfTable());
+  auto const instances = InstancesOf("CIM_BIOSElement");
+  ASSERT_EQ(instances.size(), 2u);
+  EXPECT_EQ(
+      instances[1]->GetPath(TCIMContext()).GetPath(),
+      "CIM_BIOSElement.Name=\"BIOS 1\",SoftwareElementID=\"BIOS 1\",SoftwareElementState=\"3\",TargetOperatingSystem=\"0\"");
+  EXPECT_EQ(TextOf(*instances[1], "Version"), "NULL");
+}
+
+TEST_F(HostNamespaceTest, AMangledTableFillsANamespaceAllTheSame) {
+  std::string const table = RealTable("full");
+  for (std::size_t length = 0; length < table.size(); length += 7) {
+    Fill(table.substr(0, length));
+    EXPECT_EQ(InstancesOf("QRVSG_ComputerSystem").size(), 1u) << length;
+  }
+}
+
+// ---- The plug-in ----
+
+TEST_F(HostNamespaceTest, ThePlugInRegistersItselfAndReadsTheMachineWhenItIsAsked) {
+  ASSERT_THAT(TOSSpecific::FindNSPs(), testing::Contains("Host"));
+  TOSSpecific::LoadNSPLibrary("Host");
+  auto const provider = TNamespaceProviderManager::GetInstance()->GetNamespaceProvider("Host");
+  EXPECT_EQ(provider->GetName(TCIMContext()), "Host");
+
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", RealTablePath("bare7").c_str());
+  auto const ns = provider->GetNamespace(TCIMContext());
+  EXPECT_EQ(ns->GetName(TCIMContext()), "root/zep/host");
+  EXPECT_EQ(TCIMSchemaHelper::GetMTM(ns), "1234AB7");
+
+  TEnvironmentGuard const otherTable("ZEP_SMBIOS_TABLE", RealTablePath("two-dashes").c_str());
+  EXPECT_EQ(provider->GetNamespace(TCIMContext()), ns) << "the same namespace at each call";
+  EXPECT_EQ(TCIMSchemaHelper::GetMTM(ns), "1234AB7");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,148 @@
+#include "providers/host/HostRecords.h"
+#include "providers/host/OsRelease.h"
+#include "tests/Support.h"
+#include "tests/providers/host/Structures.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/utsname.h>
+
+#include <cstring>
+
+namespace NQRVZEP20 {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+using testing::Pair;
+
+constexpr char const* kDebian = R"os(PRETTY_NAME="Debian GNU/Linux 12 (bookworm)"
+NAME="Debian GNU/Linux"
+VERSION_ID="12"
+VERSION="12 (bookworm)"
+ID=debian
+)os";
+
+TEST(OsReleaseTest, AssignmentsAreReadAsAShellReadsThem) {
+  struct TRow {
+    char const* line;
+    char const* value;
+  } const rows[] = {
+      {"A=word", "word"},
+      {"A=\"two words\"", "two words"},
+      {"A='single $quotes \\'", "single $quotes \\"},
+      {R"(A="a \"quote\", a \\, a \$, a \` and a \n")", R"(a "quote", a \, a $, a ` and a \n)"},
+      {"  A=indented", "indented"},
+      {"A=trailing blanks \t", "trailing blanks"},
+      {"A=carriage return\r", "carriage return"},
+      {"A=\"quoted\" # and more", "quoted"},
+      {"A=\"never closed", "never closed"},
+      {"A=", ""},
+      {"A=\"\"", ""},
+      {"A=1=2", "1=2"},
+      {"A=\"ends in \\", "ends in \\"},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.line);
+    EXPECT_THAT(ParseOsRelease(row.line), ElementsAre(Pair("A", row.value)));
+    EXPECT_THAT(ParseOsRelease(std::string("\n# comment\n") + row.line + "\n\n"), ElementsAre(Pair("A", row.value)));
+  }
+}
+
+TEST(OsReleaseTest, OtherLinesArePassedOverAndTheLastAssignmentCounts) {
+  EXPECT_THAT(ParseOsRelease("# A=1\n   \nno assignment\nB=1\nB=2"), ElementsAre(Pair("B", "2")));
+  EXPECT_THAT(ParseOsRelease(""), IsEmpty());
+}
+
+TEST(OsReleaseTest, TheFirstNameWithAValueIsTaken) {
+  TOsRelease const release("/etc/os-release", "VERSION=\nVERSION_ID=12\nBUILD_ID=rolling\n");
+  EXPECT_EQ(*release.Value({"VERSION", "VERSION_ID", "BUILD_ID"}), "12");
+  EXPECT_EQ(release.Value({"NAME", "ID"}).Why().fCode, "not-given");
+  EXPECT_EQ(release.Value({"NAME", "ID"}).Why().fReason, "/etc/os-release gives no NAME");
+}
+
+TEST(OsReleaseTest, WithoutAFileEveryValueSaysSo) {
+  TOsRelease const release("", "");
+  EXPECT_EQ(release.Value({"NAME"}).Why().fCode, "unreadable");
+  EXPECT_EQ(release.Value({"NAME"}).Why().fReason, "neither /etc/os-release nor /usr/lib/os-release can be read");
+}
+
+TEST(OsReleaseTest, ThisMachineHasAFileThatSaysItsName) {
+  TOsRelease const release = TOsRelease::OfThisMachine();
+  if (release.GetFile().empty()) GTEST_SKIP() << "this machine has no os-release file";
+  auto const name = release.Value({"NAME"});
+  ASSERT_TRUE(name);
+  EXPECT_NE(ReadFile(release.GetFile()).find(*name), std::string::npos);
+}
+
+utsname KernelOf(char const* node) {
+  utsname kernel = {};
+  std::strcpy(kernel.sysname, "Linux");
+  std::strcpy(kernel.nodename, node);
+  std::strcpy(kernel.release, "6.1.0-56-amd64");
+  std::strcpy(kernel.version, "#1 SMP");
+  std::strcpy(kernel.machine, "x86_64");
+  return kernel;
+}
+
+TEST(OsReleaseTest, TheOperatingSystemIsDescribedByItsFileAndItsKernel) {
+  TRecord const record =
+      OperatingSystemRecord(TOsRelease("/usr/lib/os-release", kDebian), KernelOf("db1"), TSystemName{"db1", "uname"});
+  EXPECT_EQ(record.GetClassName(), "QRVSG_OperatingSystem");
+
+  struct TRow {
+    char const *name, *value, *source;
+    bool isKey;
+  } const rows[] = {
+      {"CSCreationClassName", "string QRVSG_ComputerSystem", "", true},
+      {"CSName", "string db1", "", true},
+      {"CreationClassName", "string QRVSG_OperatingSystem", "", true},
+      {"Name", "string Debian GNU/Linux", "/usr/lib/os-release", true},
+      {"Caption", "string Debian GNU/Linux 12 (bookworm)", "/usr/lib/os-release", false},
+      {"Version", "string 12 (bookworm)", "/usr/lib/os-release", false},
+      {"OSType", "string Linux", "uname", false},
+      {"KernelRelease", "string 6.1.0-56-amd64", "uname", false},
+      {"KernelVersion", "string #1 SMP", "uname", false},
+      {"Architecture", "string x86_64", "uname", false},
+  };
+  ASSERT_EQ(record.GetProperties().size(), std::size(rows));
+  for (std::size_t at = 0; at < std::size(rows); ++at) {
+    SCOPED_TRACE(rows[at].name);
+    TRecordProperty const& property = record.GetProperties()[at];
+    EXPECT_EQ(property.fName, rows[at].name);
+    EXPECT_EQ(PropertyOf(record, rows[at].name), rows[at].value);
+    EXPECT_EQ(property.fSource, rows[at].source);
+    EXPECT_EQ(property.fIsKey, rows[at].isKey);
+  }
+}
+
+TEST(OsReleaseTest, ARollingSystemHasNoVersionButItsBuild) {
+  auto const version = [](std::string const& text) {
+    return PropertyOf(OperatingSystemRecord(TOsRelease("/etc/os-release", text), KernelOf("a"), {"a", "uname"}), "Version");
+  };
+  EXPECT_EQ(version("NAME=R\nBUILD_ID=rolling\n"), "string rolling");
+  EXPECT_EQ(version("NAME=R\nVERSION_ID=39\nBUILD_ID=x\n"), "string 39");
+  EXPECT_EQ(version("NAME=R\n"), "string NULL not-given: /etc/os-release gives no VERSION");
+}
+
+TEST(OsReleaseTest, TheEnvironmentMayNameTheMachine) {
+  TEnvironmentGuard const unset("ZEP_HOST_NAME", nullptr);
+  EXPECT_EQ(SystemNameOf(KernelOf("db1")).fName, "db1");
+  EXPECT_EQ(SystemNameOf(KernelOf("db1")).fSource, "uname");
+  TEnvironmentGuard const empty("ZEP_HOST_NAME", "");
+  EXPECT_EQ(SystemNameOf(KernelOf("db1")).fName, "db1");
+  TEnvironmentGuard const named("ZEP_HOST_NAME", "other");
+  EXPECT_EQ(SystemNameOf(KernelOf("db1")).fName, "other");
+  EXPECT_EQ(SystemNameOf(KernelOf("db1")).fSource, "ZEP_HOST_NAME");
+}
+
+TEST(OsReleaseTest, TheCollectorTellsItsVersionAndBuild) {
+  TRecord const record = ProductRecord();
+  EXPECT_EQ(record.GetClassName(), "QRVSG_ZEPProduct");
+  EXPECT_EQ(PropertyOf(record, "Name"), "string zepcore");
+  EXPECT_EQ(PropertyOf(record, "Version"), "string " TEST_VERSION);
+  EXPECT_EQ(PropertyOf(record, "Build"), "string " TEST_BUILD_ID);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

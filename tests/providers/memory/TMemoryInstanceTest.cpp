@@ -1,0 +1,139 @@
+#include "TMemoryInstance.h"
+
+#include "Collect.h"
+
+namespace NQRVZEP20 {
+namespace {
+
+class TMemoryInstanceTest : public testing::Test {
+protected:
+  TMemoryInstanceTest() {
+    ns_->DefineClass("X_Device").Key("Id", "uint32").Property("Name", "string", "unnamed");
+    ns_->DefineClass("X_Disk", "X_Device")
+        .Property("Sizes", "uint16[4]")
+        .Property("name", "string", "disk")
+        .Property("Tail", "real64");
+    ns_->DefineClass("X_Ssd", "X_Disk").Property("Cells", "uint8").Property("Letter", "char16");
+    disk_ = boost::dynamic_pointer_cast<TMemoryInstance>(ns_->GetClass("X_Disk", kNone)->CreateInstance(kNone));
+  }
+
+  boost::shared_ptr<TMemoryNamespace> const ns_ = NewNamespace();
+  boost::shared_ptr<TMemoryInstance> disk_;
+};
+
+TEST_F(TMemoryInstanceTest, PropertiesComeFromTheTopClassDownAndOverridesInTheirFirstPlace) {
+  EXPECT_THAT(Names(*disk_, &ICIMInstance::EnumerateProperties), ElementsAre("Id", "name", "Sizes", "Tail"));
+  EXPECT_EQ(VisitsUntilSecond(*disk_, &ICIMInstance::EnumerateProperties), 2);
+  auto const ssd = ns_->GetClass("X_Ssd", kNone)->CreateInstance(kNone);
+  EXPECT_THAT(Names(*ssd, &ICIMInstance::EnumerateProperties), ElementsAre("Id", "name", "Sizes", "Tail", "Cells", "Letter"));
+}
+
+TEST_F(TMemoryInstanceTest, PropertyIsFoundInAnyCaseWithItsNearestDeclaration) {
+  auto const name = disk_->GetProperty("NAME", kNone);
+  EXPECT_EQ(name->GetName(kNone), "name");
+  EXPECT_EQ(name->GetDeclaration(kNone), ns_->GetClass("X_Disk", kNone)->GetPropertyDecl("Name", kNone));
+  EXPECT_EQ(name->GetValue(kNone).ToString(), "disk");
+  EXPECT_FALSE(disk_->GetProperty("Cells", kNone));
+}
+
+TEST_F(TMemoryInstanceTest, PropertyTakesItsDeclaredTypeOnly) {
+  auto const id = disk_->GetProperty("Id", kNone);
+  id->SetValue(5u, kNone);
+  TCIMValue const refused[] = {TCIMValue(5), TCIMValue("5"), TCIMValue(), NullOf("sint32"), NullOf("uint32[]")};
+  for (TCIMValue const& value : refused) {
+    SCOPED_TRACE(static_cast<int>(value.GetType()));
+    EXPECT_STATUS(id->SetValue(value, kNone), kZEPStatusTypeMismatch);
+  }
+  EXPECT_EQ(id->GetValue(kNone).ToString(), "5");
+  id->SetValue(NullOf("uint32"), kNone);
+  EXPECT_TRUE(id->GetValue(kNone).IsNull());
+}
+
+TEST_F(TMemoryInstanceTest, PropertyTakesANewValueOfEachKind) {
+  TCIMReference one(ns_, "ns:X_Disk.Id=\"1\"", kNone), two(ns_, "ns:X_Disk.Id=\"2\"", kNone);
+  struct {
+    char const* type;
+    TCIMValue first, second;
+  } const rows[] = {
+      {"boolean", true, false},
+      {"real64", 0.5, 1.5},
+      {"char16", TCIMChar16(65), TCIMChar16(66)},  // which compare equal
+      {"string", "a", "b"},
+      {"datetime", TCIMDateTime("20070315143000.000000+060"), TCIMDateTime("20080315143000.000000+060")},
+      {"reference", one, two},
+      {"uint32[]", TCIMValue(TType::kCIMTypeUint32, 0, {TCIMValue(1u)}), TCIMValue(TType::kCIMTypeUint32, 0, {TCIMValue(2u)})},
+      {"string[2]", TCIMValue(TType::kCIMTypeString, 2, {}), TCIMValue(TType::kCIMTypeString, 2, {TCIMValue("x")})},
+  };
+  for (auto const& row : rows) {
+    SCOPED_TRACE(row.type);
+    auto const cls = ns_->DefineClass("X_Of" + std::to_string(&row - rows)).Property("P", row.type).Class();
+    auto const property = cls->CreateInstance(kNone)->GetProperty("P", kNone);
+    property->SetValue(row.first, kNone);
+    EXPECT_EQ(property->GetValue(kNone).ToString(), row.first.ToString());
+    property->SetValue(row.second, kNone);
+    EXPECT_EQ(property->GetValue(kNone).ToString(), row.second.ToString());
+    property->SetValue(property->GetValue(kNone), kNone);
+    EXPECT_EQ(property->GetValue(kNone).ToString(), row.second.ToString());
+    EXPECT_EQ(property->GetValue(kNone).GetReferencedClass(), row.second.GetReferencedClass());
+  }
+}
+
+TEST_F(TMemoryInstanceTest, ValueOfAPropertyIsACopy) {
+  disk_->Set("Sizes", TCIMValue(TType::kCIMTypeUint16, 0, {TCIMValue(static_cast<unsigned short>(1))}));
+  TCIMValue value = disk_->Get("Sizes");
+  static_cast<std::vector<TCIMValue>&>(value).clear();
+  EXPECT_EQ(disk_->Get("Sizes").ToString(), "{ 1 }");
+}
+
+TEST_F(TMemoryInstanceTest, PropertyOutlivesItsInstance) {
+  auto const name = disk_->GetProperty("Name", kNone);
+  disk_.reset();
+  EXPECT_EQ(name->GetValue(kNone).ToString(), "disk");
+  EXPECT_EQ(name->GetName(kNone), "name");
+}
+
+TEST_F(TMemoryInstanceTest, KeysAreFixedOnceTheInstanceIsCommitted) {
+  disk_->Set("Id", 1);
+  disk_->Set("Id", 2);
+  ns_->GetClass("X_Disk", kNone)->CommitInstance(disk_, kNone);
+  EXPECT_STATUS(disk_->GetProperty("Id", kNone)->SetValue(3u, kNone), kZEPStatusInvalidOpSequence);
+  EXPECT_STATUS(disk_->Set("Id", 3), kZEPStatusInvalidOpSequence);
+  EXPECT_EQ(disk_->Get("Id").ToString(), "2");
+  EXPECT_NO_THROW(disk_->Set("Name", "renamed"));
+}
+
+TEST_F(TMemoryInstanceTest, PathHasTheClassAndTheKeysThatAreNotNull) {
+  EXPECT_EQ(disk_->GetPath(kNone).GetPath(), "X_Disk");
+  disk_->Set("Id", 7);
+  TCIMReference const path = disk_->GetPath(kNone);
+  EXPECT_EQ(path.GetPath(), "X_Disk.Id=\"7\"");
+  EXPECT_EQ(path.GetClass(), ns_->GetClass("X_Disk", kNone));
+  EXPECT_EQ(path.GetNamespace(), ns_);
+}
+
+TEST_F(TMemoryInstanceTest, SetTakesPlainLiterals) {
+  disk_->Set("ID", 5);
+  EXPECT_EQ(disk_->Get("Id").GetType(), TType::kCIMTypeUint32);
+  EXPECT_EQ(disk_->Get("iD").ToString(), "5");
+  disk_->Set("Name", TCIMValue());
+  EXPECT_TRUE(disk_->Get("Name").IsNull());
+  EXPECT_EQ(disk_->Get("Name").GetType(), TType::kCIMTypeString);
+  disk_->Set("Sizes", TCIMValue(TType::kCIMTypeUint16, 0, {TCIMValue(static_cast<unsigned short>(1))}));
+  EXPECT_EQ(disk_->Get("Sizes").GetMaxArraySize(), 4u);
+
+  EXPECT_STATUS(disk_->Set("Id", -1), kZEPStatusTypeMismatch);
+  EXPECT_STATUS(disk_->Set("Id", "5"), kZEPStatusTypeMismatch);
+  EXPECT_STATUS(disk_->Set("Cells", 5), kZEPStatusNotFound);
+  EXPECT_STATUS(disk_->Get("Cells"), kZEPStatusNotFound);
+}
+
+TEST_F(TMemoryInstanceTest, ReferenceToItselfNamesIt) {
+  disk_->Set("Id", 5);
+  TCIMValue const reference = disk_->GetReference();
+  EXPECT_TRUE(reference.IsReference());
+  EXPECT_EQ(reference.ToString(), "X_Disk.Id=\"5\"");
+  EXPECT_EQ(reference.GetReferencedClass(), ns_->GetClass("X_Disk", kNone));
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,61 @@
+#include "TMemoryMethodDecl.h"
+
+#include "Collect.h"
+
+namespace NQRVZEP20 {
+namespace {
+
+class TMemoryMethodDeclTest : public testing::Test {
+protected:
+  boost::shared_ptr<TMemoryNamespace> const ns_ = NewNamespace();
+  boost::shared_ptr<ICIMMethodDecl> const method_ =
+      ns_->CreateClass(nullptr, "X_Disk", kNone)->AddMethodDecl("Reset", TType::kCIMTypeUint32, kNone);
+};
+
+TEST_F(TMemoryMethodDeclTest, ParametersTellWhatTheyWereAddedWith) {
+  struct {
+    char const* name;
+    char const* type;
+    char const* className;
+  } const rows[] = {{"Zone", "string", ""},       {"Force", "boolean", ""},        {"Bytes", "uint8[16]", ""},
+                    {"To", "reference", "X_Bay"}, {"All", "reference[]", "X_Bay"}, {"Any", "reference", ""}};
+  for (auto const& row : rows) {
+    SCOPED_TRACE(row.name);
+    TMemoryType const type(row.type);
+    auto const parameter = method_->AddParameterDecl(row.name, type.GetType(), type.GetMaxArraySize(), row.className, kNone);
+    EXPECT_EQ(parameter->GetName(kNone), row.name);
+    EXPECT_EQ(parameter->GetType(kNone), type.GetType());
+    EXPECT_EQ(parameter->GetMaxArraySize(kNone), type.GetMaxArraySize());
+    EXPECT_EQ(parameter->GetReferencedClassName(kNone), row.className);
+    EXPECT_EQ(parameter->GetMethod(kNone).lock(), method_);
+  }
+  EXPECT_THAT(Names(*method_, &ICIMMethodDecl::EnumerateParameterDecls),
+              ElementsAre("Zone", "Force", "Bytes", "To", "All", "Any"));
+  EXPECT_EQ(VisitsUntilSecond(*method_, &ICIMMethodDecl::EnumerateParameterDecls), 2);
+}
+
+TEST_F(TMemoryMethodDeclTest, ParameterIsRefusedWithItsReason) {
+  method_->AddParameterDecl("Zone", TType::kCIMTypeString, 0, "", kNone);
+  struct {
+    char const* name;
+    TType type;
+    unsigned int bound;
+    char const* className;
+    EZEPStatusCode status;
+  } const rows[] = {
+      {"ZONE", TType::kCIMTypeUint8, 0, "", kZEPStatusAlreadyExists},
+      {"A", TType::kCIMTypeInvalid, 0, "", kZEPStatusTypeMismatch},
+      {"A", TType::kCIMTypeArrayFlag, 0, "", kZEPStatusTypeMismatch},
+      {"A", TType::kCIMTypeString, 4, "", kZEPStatusNotArray},
+      {"A", TType::kCIMTypeString, 0, "X_Disk", kZEPStatusNotReference},
+      {"A b", TType::kCIMTypeString, 0, "", kZEPStatusInvalidCIMName},
+  };
+  for (auto const& row : rows) {
+    SCOPED_TRACE(row.name);
+    EXPECT_STATUS(method_->AddParameterDecl(row.name, row.type, row.bound, row.className, kNone), row.status);
+  }
+  EXPECT_THAT(Names(*method_, &ICIMMethodDecl::EnumerateParameterDecls), ElementsAre("Zone"));
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,107 @@
+#include "TMemoryQualifier.h"
+
+#include "Collect.h"
+#include "ICIMQualifierDecl.h"
+
+namespace NQRVZEP20 {
+namespace {
+
+TEST(TMemoryQualifierDeclTest, TellsWhatItWasCreatedWith) {
+  auto const ns = NewNamespace();
+  TCIMValue const defaultValue(TType::kCIMTypeString, 4, {TCIMValue("a")});
+  auto const decl =
+      ns->CreateQualifierDecl("Words", defaultValue, ICIMQualifierDecl::kScopeClass | ICIMQualifierDecl::kScopeMethod,
+                              ICIMQualifierDecl::kFlavorTranslatable, kNone);
+  EXPECT_EQ(decl->GetName(kNone), "Words");
+  EXPECT_EQ(decl->GetType(kNone), 29);
+  EXPECT_EQ(decl->GetScope(kNone), 0x21u);
+  EXPECT_EQ(decl->GetFlavor(kNone), 0x04u);
+  EXPECT_EQ(decl->GetDefaultValue(kNone), defaultValue);
+  EXPECT_EQ(decl->GetDefaultValue(kNone).GetMaxArraySize(), 4u);
+}
+
+// The qualifiers of every kind of element, which share their code but for the element.
+class TMemoryQualifierTest : public testing::TestWithParam<char const*> {
+protected:
+  TMemoryQualifierTest() {
+    ns_->DefineClass("X_Disk").Property("Name", "string").Method("Reset", "uint32").In("Force", "boolean");
+    units_ = ns_->CreateQualifierDecl("Unit", NullOf("string"), ICIMQualifierDecl::kScopeAny, 0, kNone);
+    size_ = ns_->CreateQualifierDecl("Size", NullOf("uint32"), ICIMQualifierDecl::kScopeAny, 0, kNone);
+    element_ = Element(GetParam());
+  }
+
+  boost::shared_ptr<ICIMNamedElement> Element(std::string const& kind) {
+    auto const cls = ns_->GetClass("X_Disk", kNone);
+    auto const method = All(*cls, &ICIMClass::EnumerateMethodDecls).front();
+    if (kind == "class") return cls;
+    if (kind == "property") return All(*cls, &ICIMClass::EnumeratePropertyDecls).front();
+    if (kind == "method") return method;
+    return All(*method, &ICIMMethodDecl::EnumerateParameterDecls).front();
+  }
+
+  std::vector<std::string> QualifierNames() {
+    std::vector<std::string> names = Names(*element_, &ICIMNamedElement::EnumerateQualifiers);
+    if (!names.empty() && names.front() == "In") names.erase(names.begin());  // the builder's, on the parameter
+    return names;
+  }
+
+  boost::shared_ptr<TMemoryNamespace> const ns_ = NewNamespace();
+  boost::shared_ptr<ICIMQualifierDecl> units_, size_;
+  boost::shared_ptr<ICIMNamedElement> element_;
+};
+
+INSTANTIATE_TEST_SUITE_P(Elements, TMemoryQualifierTest, testing::Values("class", "property", "method", "parameter"),
+                         [](auto const& test) { return std::string(test.param); });
+
+TEST_P(TMemoryQualifierTest, QualifierTellsWhatItWasAddedWith) {
+  auto const qualifier = element_->AddQualifier(units_, "bytes", ICIMQualifierDecl::kFlavorToSubclass, kNone);
+  EXPECT_EQ(qualifier->GetName(kNone), "Unit");
+  EXPECT_EQ(qualifier->GetValue(kNone).ToString(), "bytes");
+  EXPECT_EQ(qualifier->GetFlavor(kNone), 0x02u);
+  EXPECT_EQ(qualifier->GetDeclaration(kNone), units_);
+  EXPECT_EQ(qualifier->GetOwner(kNone).lock(), element_);
+}
+
+TEST_P(TMemoryQualifierTest, QualifiersComeInTheOrderOfAdditionAndAreFoundInAnyCase) {
+  auto const size = element_->AddQualifier(size_, NullOf("uint32"), 0, kNone);
+  element_->AddQualifier(units_, "bytes", 0, kNone);
+  EXPECT_THAT(QualifierNames(), ElementsAre("Size", "Unit"));
+  EXPECT_EQ(VisitsUntilSecond(*element_, &ICIMNamedElement::EnumerateQualifiers), 2);
+  EXPECT_EQ(element_->GetQualifier("SIZE", kNone), size);
+  EXPECT_TRUE(size->GetValue(kNone).IsNull());
+  EXPECT_FALSE(element_->GetQualifier("Other", kNone));
+}
+
+TEST_P(TMemoryQualifierTest, QualifierIsRefusedWithItsReason) {
+  auto const other = NewNamespace();
+  auto const stranger = other->CreateQualifierDecl("Unit", NullOf("string"), 0, 0, kNone);
+  auto const unknown = other->CreateQualifierDecl("Unknown", NullOf("string"), 0, 0, kNone);
+  element_->AddQualifier(units_, "bytes", 0, kNone);
+  EXPECT_STATUS(element_->AddQualifier(units_, "bytes", 0, kNone), kZEPStatusAlreadyExists);
+  EXPECT_STATUS(element_->AddQualifier(size_, "5", 0, kNone), kZEPStatusTypeMismatch);
+  EXPECT_STATUS(element_->AddQualifier(size_, TCIMValue(), 0, kNone), kZEPStatusTypeMismatch);
+  EXPECT_STATUS(element_->AddQualifier(stranger, "bytes", 0, kNone), kZEPStatusNotFound);
+  EXPECT_STATUS(element_->AddQualifier(unknown, "bytes", 0, kNone), kZEPStatusNotFound);
+  EXPECT_STATUS(element_->AddQualifier(nullptr, "bytes", 0, kNone), kZEPStatusFail);  // a failed assertion
+  EXPECT_THAT(QualifierNames(), ElementsAre("Unit"));
+}
+
+TEST(TMemoryQualifierInheritanceTest, QualifierOfASuperclassIsNotItsSubclasses) {
+  auto const ns = NewNamespace();
+  ns->DefineClass("X_Device").Description("A device.").Key("Id", "uint32");
+  ns->DefineClass("X_Disk", "X_Device").Property("Id", "uint32").Override();
+  auto const disk = ns->GetClass("X_Disk", kNone);
+  EXPECT_FALSE(disk->GetQualifier("Description", kNone));
+  EXPECT_FALSE(disk->GetPropertyDecl("Id", kNone)->GetQualifier("Key", kNone));
+}
+
+TEST(TMemoryQualifierInheritanceTest, ElementWithoutItsNamespaceTakesNoQualifier) {
+  auto ns = NewNamespace();
+  auto const cls = ns->CreateClass(nullptr, "X_Disk", kNone);
+  auto const decl = ns->CreateQualifierDecl("Unit", NullOf("string"), 0, 0, kNone);
+  ns.reset();
+  EXPECT_THROW(cls->AddQualifier(decl, "bytes", 0, kNone), boost::bad_weak_ptr);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,123 @@
+// zep config, run as users run it.
+
+#include "tests/tools/zep/Zep.h"
+
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+class ConfigTest : public testing::Test {
+protected:
+  TRun Run(std::vector<std::string> arguments, bool asNobody = false) {
+    arguments.insert(arguments.begin(), "config");
+    TCall call;
+    call.arguments = arguments;
+    call.directory = dir_.Path();
+    call.asNobody = asNobody;
+    return zep_.Run(call);
+  }
+  void Write(std::string const& text) { WriteFile(File(), text); }
+  std::string File() const { return dir_.Path("zep.cfg"); }
+
+  TInstallation zep_;
+  TTempDir dir_;
+};
+
+std::string const kText =
+    "# comment\n"
+    "server=alpha=beta\n"
+    "\n"
+    "flag\n"
+    "key = value \n"
+    "server=gamma\n"
+    "=no key\n"
+    "empty=\n"
+    "crlf=1\r\n"
+    "a#b=c#d";
+
+TEST_F(ConfigTest, ShowsTheSettingsWithTheirLinesAndTheIgnoredLinesWithTheReason) {
+  Write(kText);
+  TRun const run = Run({});
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.errors, "");
+  EXPECT_EQ(run.output, File() +
+                            "\n"
+                            "\n"
+                            "Line    Key                           Value\n"
+                            "10      a#b                           c#d\n"
+                            "9       crlf                          1\\x0d\n"
+                            "4       flag                          flag\n"
+                            "5       \"key \"                        \" value \"\n"
+                            "2       server                        alpha=beta\n"
+                            "\n"
+                            "Line    Ignored                       Why\n"
+                            "1       # comment                     a comment\n"
+                            "3                                     an empty line\n"
+                            "6       server=gamma                  line 2 sets the key, and the first counts\n"
+                            "7       =no key                       no key before \"=\"\n"
+                            "8       empty=                        no value behind \"=\"\n");
+}
+
+TEST_F(ConfigTest, ShowsOneSettingAndTheIgnoredLinesOfItsKey) {
+  Write(kText);
+  TRun const run = Run({"server"});
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.output, File() +
+                            "\n"
+                            "\n"
+                            "Line    Key                           Value\n"
+                            "2       server                        alpha=beta\n"
+                            "\n"
+                            "Line    Ignored                       Why\n"
+                            "6       server=gamma                  line 2 sets the key, and the first counts\n");
+}
+
+TEST_F(ConfigTest, PrintsJson) {
+  Write("a=1\na=2\nflag\n");
+  TRun const run = Run({"--json"});
+  EXPECT_EQ(run.status, 0);
+  auto const document = JsonOf(run);
+  EXPECT_EQ(document["version"], 1);
+  EXPECT_EQ(document["file"], File());
+  EXPECT_EQ(document["settings"], nlohmann::json::parse(R"([{"key": "a", "value": "1", "line": 1},
+                                                            {"key": "flag", "value": "flag", "line": 3}])"));
+  EXPECT_EQ(document["ignored"], nlohmann::json::parse(R"([{"line": 2, "text": "a=2",
+                                                            "reason": "line 1 sets the key, and the first counts"}])"));
+}
+
+TEST_F(ConfigTest, SaysWhyThereIsNothing) {
+  TRun run = Run({});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, "");
+  EXPECT_EQ(run.errors, "zep: there is no " + File() + "\n");
+
+  Write("");
+  run = Run({});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors, "zep: " + File() + " is empty\n");
+
+  Write("# comment\n");
+  run = Run({});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_NE(run.output.find("a comment"), std::string::npos);
+  EXPECT_EQ(run.errors, "zep: no line of " + File() + " is a setting\n");
+
+  Write("a=1\n");
+  run = Run({"b"});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, "");
+  EXPECT_EQ(run.errors, "zep: " + File() + " does not set \"b\"\n");
+
+  fs::permissions(dir_.Path(), fs::perms::all);
+  fs::permissions(File(), fs::perms::none);
+  run = Run({"--json"}, true);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_TRUE(JsonOf(run)["settings"].empty());
+  EXPECT_EQ(run.errors, "zep: " + File() + " cannot be read\n");
+}
+
+TEST_F(ConfigTest, TakesOneKeyOnly) { EXPECT_EQ(Run({"a", "b"}).status, 64); }
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

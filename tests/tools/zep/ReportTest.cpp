@@ -1,0 +1,628 @@
+// zep report, run as users run it.
+
+#include "tests/tools/zep/Zep.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+using testing::AllOf;
+using testing::ElementsAre;
+using testing::EndsWith;
+using testing::HasSubstr;
+using testing::IsEmpty;
+using testing::Not;
+using testing::StartsWith;
+
+// The rows of one of the report's tables, each a vector of cells. Cells that went on in further lines are put together
+// again, with nothing in between where a word was broken and a blank elsewhere; `widths` are those of the columns.
+std::vector<std::vector<std::string>> RowsOf(std::string const& text, std::string const& title,
+                                             std::vector<std::size_t> const& widths) {
+  std::vector<std::vector<std::string>> rows;
+  bool isInside = false;
+  for (std::string const& line : LinesOf(text)) {
+    if (!isInside) {
+      isInside = line.compare(0, title.size(), title) == 0;
+      continue;
+    }
+    if (line.empty()) break;
+    std::vector<std::string> cells;
+    std::size_t start = 0;
+    for (std::size_t width : widths) {
+      std::string cell = start < line.size() ? line.substr(start, width) : "";
+      cell.erase(cell.find_last_not_of(' ') + 1);
+      cells.push_back(cell);
+      start += width + 2;
+    }
+    if (!cells[0].empty()) {
+      rows.push_back(cells);
+      continue;
+    }
+    for (std::size_t at = 1; at < cells.size(); ++at)
+      if (!cells[at].empty()) rows.back()[at] += " " + cells[at];
+  }
+  return rows;
+}
+
+std::vector<std::vector<std::string>> ValueRowsOf(std::string const& text, std::string const& title) {
+  return RowsOf(text, title, {15, 36, 25});
+}
+std::vector<std::vector<std::string>> PlugInRowsOf(std::string const& text, std::string const& title = "Plug-in") {
+  return RowsOf(text, title, {15, 10, 51});
+}
+
+std::string WithoutBlanks(std::string text) {
+  text.erase(std::remove(text.begin(), text.end(), ' '), text.end());
+  return text;
+}
+
+// The value of a row of the text, or "no such row".
+std::string ValueIn(std::string const& text, std::string const& label) {
+  for (char const* title : {"Identity", "Details"})
+    for (auto const& row : ValueRowsOf(text, title))
+      if (row[0] == label) return row[1];
+  return "no such row";
+}
+
+class ReportTest : public testing::Test {
+protected:
+  TRun Report(std::string const& table, std::vector<std::string> const& options = {}) {
+    return Run(options, {{"ZEP_SMBIOS_TABLE", table}});
+  }
+  TRun Run(std::vector<std::string> const& options, std::map<std::string, std::string> environment) {
+    TCall call;
+    call.arguments = {"report"};
+    call.arguments.insert(call.arguments.end(), options.begin(), options.end());
+    call.environment = std::move(environment);
+    call.environment["ZEP_HOST_NAME"] = "db1";
+    return zep_.Run(call);
+  }
+
+  // Adds the test provider, with that behaviour.
+  TRun RunWithTestProvider(std::string const& behaviour, std::vector<std::string> const& options = {}) {
+    zep_.Add("libTest.nsp.so", TEST_PROVIDER);
+    return Run(options, {{"ZEP_SMBIOS_TABLE", RealTablePath("full")}, {"ZEP_TEST_PROVIDER", behaviour}});
+  }
+
+  TInstallation zep_;
+};
+
+// ---- What is told ----
+
+TEST_F(ReportTest, TheMachineOfEachRealTableIsTold) {
+  struct TRow {
+    char const *table, *machine;
+    int status;
+  } const rows[] = {
+      {"full", "db1: Server Q100, type 1234, model AB7, serial number KQ12345", 0},
+      {"bare7", "db1: 1234AB7, type 1234, model AB7, serial number KQ12345", 0},
+      {"eight", "db1: 1234AB78, type unknown, model unknown, serial number KQ12345", 2},
+      {"no-serial", "db1: Server, type 5678, model XY1, serial number unknown", 2},
+      {"two-dashes", "db1: Rack-Server Q200, type 5678, model XY1, serial number unknown", 2},
+      {"qemu-own", "db1: Standard PC (i440FX + PIIX, 1996), type unknown, model unknown, serial number unknown", 2},
+      {"entry64", "db1: Server Q100, type 1234, model AB7, serial number KQ12345", 0},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.table);
+    TRun const run = Report(RealTablePath(row.table));
+    EXPECT_EQ(run.status, row.status);
+    EXPECT_EQ(run.errors, "");
+    auto const lines = LinesOf(run.output);
+    ASSERT_GT(lines.size(), 3u);
+    EXPECT_EQ(lines[0], row.machine);
+    EXPECT_THAT(lines[1], AllOf(StartsWith("Operating system: "), HasSubstr(", Linux ")));
+    EXPECT_EQ(lines[2], "SMBIOS tables read from the file " + RealTablePath(row.table) + " (ZEP_SMBIOS_TABLE)");
+  }
+}
+
+TEST_F(ReportTest, EachRowHasItsValueOrItsReason) {
+  struct TRow {
+    char const *table, *label, *value;
+  } const rows[] = {
+      {"full", "Host name", "db1"},
+      {"full", "Product name", "Server Q100 -[1234AB7]-"},
+      {"full", "Machine type", "1234"},
+      {"full", "Model", "AB7"},
+      {"full", "Serial number", "KQ12345"},
+      {"full", "OS type", "Linux"},
+      {"full", "zepcore version", TEST_VERSION},
+      {"full", "zepcore build", TEST_BUILD_ID},
+      {"full", "Manufacturer", "Example Works"},
+      {"full", "UUID", "unknown: the firmware gives none (all zeros)"},
+      {"full", "BIOS version", "-[ABE123CUS-1.10]-"},
+      {"full", "BIOS date", "unknown: the firmware gives no text"},
+      {"full", "Chassis", "Other"},
+      {"full", "Processors", "1 x pc-i440fx-7.2, 1 core"},
+      {"full", "Memory", "512 MiB in 1 module"},
+      {"full", "Architecture", "x86_64"},
+      {"eight", "Machine type", "unknown: not in the expected form: \"1234AB78\""},
+      {"eight", "Model", "unknown: not in the expected form: \"1234AB78\""},
+      {"no-serial", "Serial number", "unknown: the firmware gives no text"},
+      {"two-dashes", "Serial number", "unknown: not in the expected form: \"KQ 99\""},
+  };
+  for (TRow const& row : rows) EXPECT_EQ(ValueIn(Report(RealTablePath(row.table)).output, row.label), row.value) << row.table;
+}
+
+TEST_F(ReportTest, AProductNameWithoutModelTellsSo) {
+  TRun const run = Report(zep_.Table(SystemInformation("Server X1-[1234]-", "KQ12345") + EndOfTable()));
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(ValueIn(run.output, "Machine type"), "1234");
+  EXPECT_EQ(ValueIn(run.output, "Model"), "unknown: the product name tells the machine type only");
+  EXPECT_EQ(LinesOf(run.output)[0], "db1: Server X1, type 1234, model unknown, serial number KQ12345");
+}
+
+TEST_F(ReportTest, PlaceholdersOfTheFirmwareAreToldAsSuch) {
+  TRun const run = Report(zep_.Table(SystemInformation("To Be Filled By O.E.M.", "System Serial Number") + EndOfTable()));
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(ValueIn(run.output, "Product name"), "unknown: placeholder text of the firmware: \"To Be Filled By O.E.M.\"");
+  EXPECT_EQ(ValueIn(run.output, "Machine type"), "unknown: placeholder text of the firmware: \"To Be Filled By O.E.M.\"");
+  EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: placeholder text of the firmware: \"System Serial Number\"");
+}
+
+TEST_F(ReportTest, TwoKindsOfProcessorAndModulesOfUnknownSizeAreToldApart) {
+  std::string const processor =
+      "\0\3\1\0"s + std::string(8, '\0') + "\1"s + std::string(7, '\0') + "\x41"s + std::string(23, '\0');
+  std::string const module = std::string(8, '\0') + "\0\2"s + std::string(20, '\0');
+  std::string const unknownModule = std::string(8, '\0') + "\xff\xff"s + std::string(20, '\0');
+  TRun const run = Report(zep_.Table(Structure(4, processor, {"Kind B"}) + Structure(4, processor, {"Kind A"}) +
+                                     Structure(4, processor, {"Kind A"}) + Structure(17, module) + Structure(17, unknownModule) +
+                                     EndOfTable()));
+  EXPECT_EQ(ValueIn(run.output, "Processors"), "2 x Kind A, 1 x Kind B");
+  EXPECT_EQ(ValueIn(run.output, "Memory"), "512 MiB in 2 modules, 1 of them of unknown size");
+}
+
+// ---- Why there are no tables ----
+
+TEST_F(ReportTest, ATableFileThatCannotBeReadSaysWhy) {
+  TRun const missing = Report(zep_.Path("nothing"));
+  EXPECT_EQ(missing.status, 2);
+  EXPECT_EQ(LinesOf(missing.output)[0], "db1: not identified: the SMBIOS table file " + zep_.Path("nothing") + " does not exist");
+
+  TRun const garbage = Report(zep_.Table("_SM_ and no more"));
+  EXPECT_EQ(garbage.status, 2);
+  EXPECT_THAT(LinesOf(garbage.output)[0], EndsWith(" holds no SMBIOS table"));
+}
+
+TEST_F(ReportTest, ATableFileOfAnotherUserSaysWhy) {
+  std::string const table = zep_.Table(RealTable("full"));
+  fs::permissions(table, fs::perms::owner_all);
+  if (::geteuid() != 0) fs::permissions(table, fs::perms::none);
+  TCall call;
+  call.arguments = {"report"};
+  call.environment = {{"ZEP_SMBIOS_TABLE", table}, {"ZEP_HOST_NAME", "db1"}};
+  call.asNobody = true;
+  TRun const run = zep_.Run(call);
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(LinesOf(run.output)[0], "db1: not identified: the SMBIOS table file " + table + " may not be read by this user");
+}
+
+TEST_F(ReportTest, TheSystemsOwnTablesSayWhyTheyCannotBeRead) {
+  zep_.Add("libsmbios.so", FAKE_SMBIOS);
+  struct TRow {
+    char const *behaviour, *machine, *code;
+  } const rows[] = {
+      {"finds no file", "db1: not identified: no SMBIOS tables exported", "no-smbios"},
+      {"is denied access", "db1: not identified: needs root (SMBIOS tables)", "needs-root"},
+      {"fails", "db1: not identified: the system's SMBIOS tables cannot be read", "unreadable"},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.behaviour);
+    TRun const run = Run({}, {{"FAKE_SMBIOS", row.behaviour}});
+    EXPECT_EQ(run.status, 2);
+    EXPECT_EQ(LinesOf(run.output)[0], row.machine);
+    auto const identity = JsonOf(Run({"--json"}, {{"FAKE_SMBIOS", row.behaviour}}))["identity"];
+    for (char const* key : {"productName", "machineType", "model", "serialNumber"}) {
+      EXPECT_EQ(identity[key]["code"], row.code) << key;
+      EXPECT_TRUE(identity[key]["value"].is_null()) << key;
+    }
+    EXPECT_EQ(identity["hostName"]["value"], "db1");
+  }
+}
+
+TEST_F(ReportTest, WithoutTheSmbiosLibraryTheLinkersReasonIsTold) {
+  zep_.Remove("libsmbios.so");
+  TRun const run = Run({}, {});
+  EXPECT_EQ(run.status, 2);
+  EXPECT_THAT(LinesOf(run.output)[0], AllOf(StartsWith("db1: not identified: the SMBIOS library cannot be loaded: libsmbios.so"),
+                                            HasSubstr("No such file")));
+}
+
+// ---- JSON ----
+
+TEST_F(ReportTest, JsonAgreesWithTheText) {
+  for (std::string const& table : kRealTables) {
+    SCOPED_TRACE(table);
+    TRun const text = Report(RealTablePath(table)), json = Report(RealTablePath(table), {"--json"});
+    EXPECT_EQ(json.status, text.status);
+    EXPECT_EQ(json.errors, "");
+    auto const document = JsonOf(json);
+    EXPECT_EQ(document["version"], 1);
+    EXPECT_EQ(document["document"], "zep report");
+    EXPECT_EQ(document["sample"], false);
+    EXPECT_EQ(document["exitStatus"], text.status);
+    EXPECT_EQ(document["status"], text.status == 0 ? "complete" : "partial");
+    EXPECT_EQ(document["smbiosTableFile"], RealTablePath(table));
+    EXPECT_EQ(document["head"][0], LinesOf(text.output)[0]);
+    EXPECT_EQ(document["head"][1], LinesOf(text.output)[1]);
+
+    std::size_t compared = 0;
+    for (auto const& [key, title] : std::map<std::string, std::string>{{"identity", "Identity"}, {"details", "Details"}}) {
+      auto const rows = ValueRowsOf(text.output, title);
+      ASSERT_EQ(rows.size(), document[key].size());
+      for (auto const& entry : document[key]) {
+        auto const row = std::find_if(rows.begin(), rows.end(), [&](auto const& cells) { return cells[0] == entry["label"]; });
+        ASSERT_NE(row, rows.end()) << entry;
+        std::string const value =
+            entry["value"].is_null() ? "unknown: " + entry["reason"].get<std::string>() : entry["value"].get<std::string>();
+        EXPECT_EQ(WithoutBlanks((*row)[1]), WithoutBlanks(value));
+        EXPECT_EQ(WithoutBlanks((*row)[2]), WithoutBlanks(entry["source"]));
+        EXPECT_EQ(entry["value"].is_null(), entry.contains("code")) << entry;
+        ++compared;
+      }
+    }
+    EXPECT_EQ(compared, 19u);
+    ASSERT_EQ(document["plugIns"].size(), 1u);
+    EXPECT_EQ(document["plugIns"][0]["name"], "Host");
+    EXPECT_EQ(document["plugIns"][0]["file"], zep_.Path("lib/libHost.nsp.so"));
+    EXPECT_TRUE(document["plugIns"][0]["error"].is_null());
+    EXPECT_EQ(document["plugIns"][0]["providers"][0]["namespace"], "root/zep/host");
+  }
+}
+
+TEST_F(ReportTest, JsonListsEveryInstanceWithItsPath) {
+  auto const document = JsonOf(Report(SamplePath(), {"--json"}));
+  std::map<std::string, int> counts;
+  std::vector<std::string> paths;
+  for (auto const& instance : document["instances"]) {
+    ++counts[instance["class"]];
+    paths.push_back(instance["path"]);
+    EXPECT_EQ(instance["path"].get<std::string>().find("root/zep/host:" + instance["class"].get<std::string>() + "."), 0u);
+  }
+  EXPECT_EQ(counts, (std::map<std::string, int>{{"QRVSG_ComputerSystem", 1},
+                                                {"QRVSG_OperatingSystem", 1},
+                                                {"QRVSG_ZEPProduct", 1},
+                                                {"CIM_BIOSElement", 1},
+                                                {"CIM_Chassis", 1},
+                                                {"CIM_Processor", 2},
+                                                {"CIM_PhysicalMemory", 8},
+                                                {"ZEP_MissingValue", 2}}));
+  std::sort(paths.begin(), paths.end());
+  EXPECT_EQ(std::unique(paths.begin(), paths.end()), paths.end());
+}
+
+TEST_F(ReportTest, JsonTellsWhyAPropertyIsNull) {
+  auto const document = JsonOf(Report(RealTablePath("no-serial"), {"--json"}));
+  for (auto const& instance : document["instances"]) {
+    if (instance["class"] != "QRVSG_ComputerSystem") continue;
+    auto const serial = instance["properties"]["SerialNumber"];
+    EXPECT_EQ(serial["type"], "string");
+    EXPECT_TRUE(serial["value"].is_null());
+    EXPECT_EQ(serial["code"], "not-given");
+    EXPECT_EQ(serial["reason"], "the firmware gives no text");
+    EXPECT_EQ(serial["source"], "SMBIOS type 1 (file)");
+    EXPECT_EQ(instance["properties"]["Name"]["key"], true);
+    return;
+  }
+  FAIL() << "no computer system";
+}
+
+// ---- The sample ----
+
+TEST_F(ReportTest, TheSampleIsLabelledInEveryLineOfTheText) {
+  TRun const run = zep_.Run({{"report", "--sample"}});
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.errors, "");
+  auto const lines = LinesOf(run.output);
+  ASSERT_GT(lines.size(), 2u);
+  EXPECT_EQ(lines[0], "SAMPLE sample-server: Server Q100, type 1234, model AB7, serial number KQ12345");
+  EXPECT_THAT(lines[1], StartsWith("SAMPLE operating system of this machine, not of the sample: "));
+  for (char const* title : {"SAMPLE Identity", "SAMPLE Details"}) {
+    auto const rows = ValueRowsOf(run.output, title);
+    EXPECT_FALSE(rows.empty()) << title;
+    for (auto const& row : rows)
+      EXPECT_TRUE(row[2].find("SAMPLE") == 0 || row[2].find("(not of the sample)") != std::string::npos)
+          << row[0] << ": " << row[2];
+  }
+  EXPECT_EQ(PlugInRowsOf(run.output, "SAMPLE Plug-in").size(), 1u);
+}
+
+TEST_F(ReportTest, TheSampleIsLabelledInJson) {
+  auto const document = JsonOf(zep_.Run({{"report", "--sample", "--json"}}));
+  EXPECT_EQ(document["sample"], true);
+  EXPECT_EQ(document["label"], "SAMPLE");
+  EXPECT_EQ(document["status"], "complete");
+  for (auto const& line : document["head"]) EXPECT_THAT(line.get<std::string>(), StartsWith("SAMPLE "));
+  EXPECT_EQ(document["identity"]["hostName"]["value"], "sample-server");
+  EXPECT_EQ(document["identity"]["hostName"]["source"], "SAMPLE");
+  EXPECT_EQ(document["identity"]["serialNumber"]["source"], "SAMPLE, SMBIOS type 1");
+  EXPECT_THAT(document["identity"]["osName"]["source"].get<std::string>(), EndsWith("(not of the sample)"));
+  for (auto const& instance : document["instances"])
+    for (auto const& [name, property] : instance["properties"].items()) {
+      std::string const source = property["source"];
+      EXPECT_TRUE(source.find("SAMPLE") == 0 || source.find("(not of the sample)") != std::string::npos ||
+                  source == "provider Host")
+          << name << ": " << source;
+    }
+}
+
+TEST_F(ReportTest, TheSampleHidesThisMachinesNameAndTheCallersTable) {
+  char name[256] = {};
+  ASSERT_EQ(::gethostname(name, sizeof name - 1), 0);
+  TCall call;
+  call.arguments = {"report", "--sample", "--json"};
+  call.environment = {{"ZEP_SMBIOS_TABLE", RealTablePath("bare7")}, {"ZEP_HOST_NAME", "db1"}};
+  TRun const run = zep_.Run(call);
+  EXPECT_THAT(run.output, Not(HasSubstr("\"" + std::string(name) + "\"")));
+  EXPECT_THAT(run.output, Not(HasSubstr("db1")));
+  EXPECT_EQ(JsonOf(run)["identity"]["productName"]["value"], "Server Q100 -[1234AB7]-");
+  EXPECT_TRUE(JsonOf(run)["smbiosTableFile"].is_null());
+}
+
+TEST_F(ReportTest, ASampleThatIsNotInstalledIsAnError) {
+  fs::remove_all(zep_.Path("share"));
+  TRun const run = zep_.Run({{"report", "--sample"}});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, "");
+  EXPECT_EQ(run.errors, "zep: the sample is not installed: " + zep_.Path("share/zepcore/sample/smbios.bin") + " is missing\n");
+}
+
+// ---- Plug-ins ----
+
+TEST_F(ReportTest, WithoutPlugInsNothingIsTold) {
+  zep_.Remove("libHost.nsp.so");
+  TRun const run = Report(RealTablePath("full"));
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(LinesOf(run.output)[0], "Unnamed machine: not identified: no provider plug-in found");
+  EXPECT_EQ(LinesOf(run.output)[1], "Operating system: unknown: no provider plug-in found");
+  for (char const* title : {"Identity", "Details"})
+    for (auto const& row : ValueRowsOf(run.output, title)) {
+      EXPECT_EQ(row[1], "unknown: no provider plug-in found");
+      EXPECT_EQ(row[2], "none");
+    }
+  ASSERT_EQ(PlugInRowsOf(run.output).size(), 1u);
+  EXPECT_EQ(PlugInRowsOf(run.output)[0][0], "none");
+  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(run.output)[0][2]), WithoutBlanks("no file lib*.nsp.so in " + zep_.Path("lib")));
+
+  TRun const json = Report(RealTablePath("full"), {"--json"});
+  EXPECT_EQ(json.status, 1);
+  auto const document = JsonOf(json);
+  EXPECT_EQ(document["status"], "nothing");
+  EXPECT_THAT(document["plugIns"], IsEmpty());
+  EXPECT_THAT(document["instances"], IsEmpty());
+  EXPECT_EQ(document["identity"]["serialNumber"]["code"], "not-described");
+}
+
+TEST_F(ReportTest, ABrokenPlugInIsToldWithTheLinkersReasonAndStopsNoOther) {
+  WriteFile(zep_.Path("lib/libBroken.nsp.so"), "this is no library");
+  TRun const run = Report(RealTablePath("full"));
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(run.errors, "");
+  EXPECT_EQ(LinesOf(run.output)[0], "db1: Server Q100, type 1234, model AB7, serial number KQ12345");
+  auto const rows = PlugInRowsOf(run.output);
+  ASSERT_EQ(rows.size(), 2u);
+  EXPECT_EQ(rows[0][0], "Broken");
+  EXPECT_THAT(rows[0][1], testing::MatchesRegex("[0-9]+\\.[0-9] ms"));
+  EXPECT_EQ(WithoutBlanks(rows[0][2]), WithoutBlanks("failed: " + zep_.Path("bin/../lib/libBroken.nsp.so") + ": file too short"));
+  EXPECT_EQ(rows[1][0], "Host");
+  EXPECT_EQ(rows[1][2], "filled root/zep/host");
+
+  auto const plugIn = JsonOf(Report(RealTablePath("full"), {"--json"}))["plugIns"][0];
+  EXPECT_EQ(plugIn["error"], zep_.Path("bin/../lib/libBroken.nsp.so") + ": file too short");
+  EXPECT_EQ(plugIn["file"], zep_.Path("lib/libBroken.nsp.so"));
+  EXPECT_THAT(plugIn["providers"], IsEmpty());
+}
+
+TEST_F(ReportTest, ABrokenPlugInAloneTellsNothing) {
+  zep_.Remove("libHost.nsp.so");
+  WriteFile(zep_.Path("lib/libBroken.nsp.so"), "this is no library");
+  TRun const run = Report(RealTablePath("full"));
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(LinesOf(run.output)[0], "Unnamed machine: not identified: no provider plug-in works");
+}
+
+TEST_F(ReportTest, AProviderThatFailsIsToldAndStopsNoOther) {
+  struct TRow {
+    char const *behaviour, *result;
+  } const rows[] = {
+      {"throws", "provider Test failed: kZEPStatusAccessDenied"},
+      {"throws-a-number", "provider Test failed: it threw something that is no exception of the standard library"},
+      {"no-namespace", "provider Test failed: it has no namespace"},
+      {"fails-at-once", "provider Test failed: kZEPStatusFail"},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.behaviour);
+    TRun const run = RunWithTestProvider(row.behaviour);
+    EXPECT_EQ(run.status, 2);
+    EXPECT_EQ(LinesOf(run.output)[0], "db1: Server Q100, type 1234, model AB7, serial number KQ12345");
+    auto const plugIns = PlugInRowsOf(run.output);
+    ASSERT_EQ(plugIns.size(), 2u);
+    EXPECT_EQ(plugIns[1][0], "Test");
+    EXPECT_EQ(plugIns[1][2], row.result);
+    auto const provider = JsonOf(RunWithTestProvider(row.behaviour, {"--json"}))["plugIns"][1]["providers"][0];
+    EXPECT_EQ("provider Test failed: " + provider["error"].get<std::string>(), row.result);
+    EXPECT_TRUE(provider["namespace"].is_null());
+  }
+}
+
+TEST_F(ReportTest, ANamespaceThatFailsLaterIsToldWhereItFails) {
+  zep_.Remove("libHost.nsp.so");
+  TRun const run = RunWithTestProvider("fails-later");
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: provider Test failed: kZEPStatusFail");
+
+  auto const document = JsonOf(RunWithTestProvider("fails-later", {"--json"}));
+  EXPECT_THAT(document["instances"], IsEmpty());
+  EXPECT_EQ(document["instanceFailures"][0]["provider"], "Test");
+  EXPECT_EQ(document["instanceFailures"][0]["error"], "it threw something that is no exception of the standard library");
+}
+
+TEST_F(ReportTest, APlugInThatRegistersNothingIsTold) {
+  for (char const* behaviour : {"is-silent", "calls-itself-host"}) {
+    TRun const run = RunWithTestProvider(behaviour);
+    EXPECT_EQ(run.status, 0) << behaviour;
+    EXPECT_EQ(PlugInRowsOf(run.output)[1][2], "loaded, but registered no provider of its own") << behaviour;
+  }
+}
+
+TEST_F(ReportTest, WhatPlugInsPrintDoesNotGetIntoTheDocument) {
+  TRun const run = RunWithTestProvider("prints", {"--json"});
+  EXPECT_EQ(JsonOf(run)["plugIns"].size(), 2u);
+  EXPECT_THAT(run.output, StartsWith("{"));
+  EXPECT_THAT(run.errors, AllOf(HasSubstr("noise while loading"), HasSubstr("noise while filling")));
+}
+
+TEST_F(ReportTest, TheFirstProviderThatKnowsAnswers) {
+  EXPECT_EQ(ValueIn(RunWithTestProvider("one-system").output, "Host name"), "db1");
+  zep_.Remove("libHost.nsp.so");
+  TRun const run = RunWithTestProvider("one-system");
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(LinesOf(run.output)[0], "one: 1234AB7, type 1234, model AB7, serial number KQ12345");
+  EXPECT_EQ(ValueRowsOf(run.output, "Identity")[0][2], "provider Test");
+  EXPECT_EQ(ValueIn(run.output, "OS"), "unknown: no provider describes it");
+}
+
+TEST_F(ReportTest, TwoSystemsAreNotOneIdentity) {
+  zep_.Remove("libHost.nsp.so");
+  TRun const run = RunWithTestProvider("two-systems");
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: the provider describes 2 of them");
+}
+
+// ---- Foreign bytes ----
+
+TEST_F(ReportTest, WhatTheFirmwareSaysCannotControlTheTerminal) {
+  std::string const table = zep_.Table(SystemInformation("\x1b]0;owned\x07\x1b[2J\xff Q \xc3\xa9 \xe2\x80\xae -[1234AB7]-",
+                                                         "\x9b"
+                                                         "31m\n\t") +
+                                       EndOfTable());
+  TRun const text = Report(table);
+  for (unsigned char c : text.output) EXPECT_TRUE(c == '\n' || (c >= 0x20 && c != 0x7f)) << static_cast<int>(c);
+  EXPECT_THAT(LinesOf(text.output)[0],
+              StartsWith("db1: \\x1b]0;owned\\x07\\x1b[2J\\xff Q \xc3\xa9 \\u202e, type 1234, model AB7"));
+
+  TRun const json = Report(table, {"--json"});
+  EXPECT_EQ(JsonOf(json)["identity"]["productName"]["value"],
+            "\x1b]0;owned\x07\x1b[2J\xef\xbf\xbd Q \xc3\xa9 \xe2\x80\xae -[1234AB7]-");
+  EXPECT_THAT(json.output, Not(HasSubstr("\x1b")));
+}
+
+TEST_F(ReportTest, OddValuesOfAProviderMakeOneValidDocument) {
+  auto const document = JsonOf(RunWithTestProvider("odd", {"--json"}));
+  for (auto const& instance : document["instances"]) {
+    if (instance["class"] != "X_Odd") continue;
+    auto const& properties = instance["properties"];
+    EXPECT_EQ(properties["Text"]["value"], "\x1b]0;title\x07 \xe2\x80\xae reversed");
+    EXPECT_EQ(properties["Bytes"]["value"], "\xef\xbf\xbd\xef\xbf\xbd no UTF-8");
+    EXPECT_EQ(properties["Flag"]["value"], true);
+    EXPECT_EQ(properties["Large"]["value"], 18446744073709551615u);
+    EXPECT_EQ(properties["Small"]["value"].dump(), "-9223372036854775808");
+    EXPECT_EQ(properties["Half"]["value"], 0.5);
+    EXPECT_EQ(properties["Infinite"]["value"], "inf");
+    EXPECT_EQ(properties["List"]["type"], "string[]");
+    EXPECT_EQ(properties["List"]["value"], nlohmann::json({"a", "b, c"}));
+    EXPECT_EQ(properties["Numbers"]["value"], nlohmann::json({1, 255}));
+    EXPECT_TRUE(properties["Nothing"]["value"].is_null());
+    EXPECT_EQ(properties["Nothing"]["reason"], "the provider gives no value");
+    EXPECT_EQ(properties["Nothing"]["source"], "provider Test");
+    return;
+  }
+  FAIL() << "no odd instance";
+}
+
+TEST_F(ReportTest, TablesFitIntoEightyColumns) {
+  WriteFile(zep_.Path("lib/libBroken.nsp.so"), "this is no library");
+  for (TRun const& run : {Report(zep_.Table(SystemInformation(std::string(300, 'x'), std::string(200, 'y')) + EndOfTable())),
+                          zep_.Run({{"report", "--sample"}}), Run({}, {})}) {
+    auto const lines = LinesOf(run.output);
+    bool isTable = false;  // the head lines stand alone, in front of the first empty one
+    for (std::string const& line : lines) {
+      isTable = isTable || line.empty();
+      if (!isTable) continue;
+      EXPECT_LE(line.size(), 80u) << line;
+    }
+  }
+}
+
+// ---- Where the output goes ----
+
+TEST_F(ReportTest, AReaderWhoWentAwayEndsItQuietly) {
+  int ends[2];
+  ASSERT_EQ(::pipe(ends), 0);
+  ::close(ends[0]);
+  TCall call;
+  call.arguments = {"report", "--sample"};
+  call.outputDescriptor = ends[1];
+  TRun const run = zep_.Run(call);
+  EXPECT_EQ(run.status, 128 + SIGPIPE);
+  EXPECT_EQ(run.errors, "");
+
+  call.ignoresBrokenPipes = true;
+  TRun const ignoring = zep_.Run(call);
+  EXPECT_EQ(ignoring.status, 1);
+  EXPECT_EQ(ignoring.errors, "zep: standard output cannot be written: Broken pipe\n");
+  ::close(ends[1]);
+}
+
+TEST_F(ReportTest, AFullDiskIsAnError) {
+  if (!fs::exists("/dev/full")) GTEST_SKIP() << "no /dev/full";
+  TCall call;
+  call.arguments = {"report", "--json", "--sample"};
+  call.outputFile = "/dev/full";
+  TRun const run = zep_.Run(call);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors, "zep: standard output cannot be written: No space left on device\n");
+}
+
+// ---- Arguments ----
+
+TEST_F(ReportTest, WrongUsageIsToldOnStandardError) {
+  std::vector<std::string> const calls[] = {{},
+                                            {"nonsense"},
+                                            {"report", "--nonsense"},
+                                            {"report", "extra"},
+                                            {"--nonsense"},
+                                            {"report", "show"},
+                                            {"report", "--json=perhaps"},
+                                            {"show"},
+                                            {"show", "a", "b"}};
+  for (auto const& arguments : calls) {
+    SCOPED_TRACE(testing::PrintToString(arguments));
+    TCall call;
+    call.arguments = arguments;
+    TRun const run = zep_.Run(call);
+    EXPECT_EQ(run.status, 64);
+    EXPECT_EQ(run.output, "");
+    EXPECT_NE(run.errors, "");
+  }
+}
+
+TEST_F(ReportTest, HelpAndVersionAreAnswered) {
+  TRun const version = zep_.Run({{"--version"}});
+  EXPECT_EQ(version.status, 0);
+  EXPECT_EQ(version.output, "zep " TEST_VERSION " (build " TEST_BUILD_ID ")\n");
+  struct TRow {
+    std::vector<std::string> arguments;
+    std::vector<char const*> words;
+  } const rows[] = {
+      {{"--help"}, {"report", "show", "--version"}},
+      {{"-h"}, {"report", "show"}},
+      {{"report", "--help"}, {"--json", "--sample", "Exit status"}},
+      {{"show", "--help"}, {"path", "--json", "--sample", "Exit status"}},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(testing::PrintToString(row.arguments));
+    TCall call;
+    call.arguments = row.arguments;
+    TRun const run = zep_.Run(call);
+    EXPECT_EQ(run.status, 0);
+    EXPECT_EQ(run.errors, "");
+    for (char const* word : row.words) EXPECT_THAT(run.output, HasSubstr(word));
+  }
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,73 @@
+// zep run, run as users run it.
+
+#include "tests/tools/zep/Zep.h"
+
+#include <gtest/gtest.h>
+
+#include <chrono>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+class RunTest : public testing::Test {
+protected:
+  TRun Run(std::vector<std::string> arguments) {
+    arguments.insert(arguments.begin(), "run");
+    return zep_.Run({arguments});
+  }
+
+  TInstallation zep_;
+};
+
+TEST_F(RunTest, PrintsTheOutputOfTheCommand) {
+  TRun const run = Run({"sh", "-c", "echo out; echo err >&2; echo \"$0 $1\"", "zero", "a  b"});
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.output, "out\nerr\nzero a  b\n");
+  EXPECT_EQ(run.errors, "");
+}
+
+TEST_F(RunTest, OptionsBehindTheCommandAreTheCommands) {
+  TRun const run = Run({"echo", "--timeout", "1", "--help", "-x"});
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.output, "--timeout 1 --help -x\n");
+}
+
+TEST_F(RunTest, TellsThatACommandFailed) {
+  std::string const reason = " could not be executed, did not exit with 0 or was ended by a signal\n";
+  for (std::vector<std::string> const& command :
+       {std::vector<std::string>{"sh", "-c", "echo said; exit 3"}, {"sh", "-c", "echo said; kill -9 $$"}}) {
+    TRun const run = Run(command);
+    EXPECT_EQ(run.status, 1);
+    EXPECT_EQ(run.output, "said\n");
+    EXPECT_EQ(run.errors, "zep: sh" + reason);
+  }
+  TRun const run = Run({"/nonexistent"});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, "");
+  EXPECT_EQ(run.errors, "zep: /nonexistent" + reason);
+}
+
+TEST_F(RunTest, TheTimeoutIsOneOfSilence) {
+  EXPECT_EQ(Run({"--timeout", "2", "sh", "-c", "sleep 1; echo a; sleep 1; echo b; sleep 1"}).output, "a\nb\n");
+  auto const start = std::chrono::steady_clock::now();
+  TRun const run = Run({"--timeout", "1", "sh", "-c", "echo $$; exec sleep 30"});
+  EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(20));
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors,
+            "zep: sh could not be executed, did not exit with 0 or was ended by a signal, or was silent for more than 1 s and is "
+            "left running\n");
+  EXPECT_EQ(::kill(std::stoi(run.output), SIGKILL), 0) << "the command should still run";
+}
+
+TEST_F(RunTest, WithoutACommandOrWithAnOddTimeoutItIsWrongUsage) {
+  TRun const run = Run({});
+  EXPECT_EQ(run.status, 64);
+  EXPECT_EQ(run.errors, "zep: there is no command to run\n");
+  for (char const* timeout : {"-2", "x", "99999999999"}) EXPECT_EQ(Run({"--timeout", timeout, "true"}).status, 64) << timeout;
+  TRun const unknown = Run({"--unknown", "true"});
+  EXPECT_EQ(unknown.status, 64);
+  EXPECT_EQ(unknown.errors, "zep: there is no option --unknown\n");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

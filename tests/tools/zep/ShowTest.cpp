@@ -1,0 +1,126 @@
+// zep show, run as users run it.
+
+#include "tests/tools/zep/Zep.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+using testing::ElementsAre;
+using testing::HasSubstr;
+
+class ShowTest : public testing::Test {
+protected:
+  ShowTest() { zep_.Add("libTest.nsp.so", TEST_PROVIDER); }
+
+  TRun Run(std::vector<std::string> const& arguments) {
+    TCall call;
+    call.arguments = arguments;
+    call.environment = {{"ZEP_SMBIOS_TABLE", SamplePath()}, {"ZEP_HOST_NAME", "db1"}, {"ZEP_TEST_PROVIDER", "odd"}};
+    return zep_.Run(call);
+  }
+
+  TInstallation zep_;
+};
+
+TEST_F(ShowTest, EveryPathThatOneRunPrintsAnotherOneShows) {
+  auto const instances = JsonOf(Run({"report", "--json"}))["instances"];
+  EXPECT_EQ(instances.size(), 19u);
+  for (auto const& instance : instances) {
+    TRun const run = Run({"show", instance["path"], "--json"});
+    EXPECT_EQ(run.status, 0) << instance["path"] << run.errors;
+    if (run.status != 0) continue;
+    EXPECT_EQ(JsonOf(run)["object"], instance);
+  }
+}
+
+TEST_F(ShowTest, AnObjectIsShownWithTypesAndValues) {
+  TRun const run = Run({"show", "root/zep/host:CIM_Chassis.CreationClassName=\"CIM_Chassis\",Tag=\"Chassis 0\""});
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.output,
+            "root/zep/host:CIM_Chassis.CreationClassName=\"CIM_Chassis\",Tag=\"Chassis 0\"\n"
+            "\n"
+            "Property                  Type        Value\n"
+            "Tag                       string      Chassis 0\n"
+            "CreationClassName         string      CIM_Chassis\n"
+            "Manufacturer              string      Example Works\n"
+            "Version                   string      Rack 2U\n"
+            "SerialNumber              string      KQ12345\n"
+            "UserTracking              string      RACK-07-U21\n"
+            "SKU                       string      1234AB7\n"
+            "ChassisPackageType        uint16      23\n"
+            "ChassisTypeDescription    string      Rack Mount Chassis\n"
+            "LockPresent               boolean     false\n"
+            "Height                    real32      3.5\n"
+            "NumberOfPowerCords        uint16      2\n");
+}
+
+TEST_F(ShowTest, APathWithoutNamespaceIsLookedForInAll) {
+  EXPECT_EQ(Run({"show", "CIM_Chassis.CreationClassName=\"CIM_Chassis\",Tag=\"Chassis 0\""}).status, 0);
+  EXPECT_EQ(Run({"show", "X_Link.Id=\"1\""}).status, 0);
+}
+
+TEST_F(ShowTest, AMissingValueSaysWhy) {
+  TRun const run = Run({"show",
+                        "CIM_Processor.CreationClassName=\"CIM_Processor\",DeviceID=\"Processor 0\","
+                        "SystemCreationClassName=\"QRVSG_ComputerSystem\",SystemName=\"db1\""});
+  EXPECT_THAT(run.output, HasSubstr("UniqueID                  string      NULL: the firmware gives none (all zeros)\n"));
+}
+
+TEST_F(ShowTest, AClassIsShownWithInheritedPropertiesAndItsInstances) {
+  TRun const run = Run({"show", "X_Odd"});
+  EXPECT_EQ(run.status, 0);
+  EXPECT_THAT(run.output, testing::StartsWith("root/test:X_Odd : X_Base\n"
+                                              "\n"
+                                              "Property                  Type        Key    Default\n"
+                                              "Id                        string      key    NULL\n"
+                                              "Inherited                 uint8              NULL\n"
+                                              "Text                      string             NULL\n"));
+  EXPECT_THAT(run.output, HasSubstr("List                      string[]           NULL\n"));
+  EXPECT_THAT(run.output, HasSubstr("\nInstances\nroot/test:X_Odd.Id=\"quote \\\" and \\\\ and \\x1b[31m\"\n"));
+
+  auto const object = JsonOf(Run({"show", "root/test:X_Odd", "--json"}))["object"];
+  EXPECT_EQ(object["class"], "X_Odd");
+  EXPECT_EQ(object["superClass"], "X_Base");
+  EXPECT_EQ(object["properties"]["Id"]["key"], true);
+  EXPECT_EQ(object["instances"].size(), 1u);
+}
+
+TEST_F(ShowTest, AClassWithoutInstancesSaysWhy) {
+  TCall call;
+  call.arguments = {"show", "CIM_Chassis"};
+  call.environment = {{"ZEP_SMBIOS_TABLE", zep_.Path("nothing")}};
+  EXPECT_THAT(zep_.Run(call).output,
+              HasSubstr("\nInstances\nnone: the SMBIOS table file " + zep_.Path("nothing") + " does not exist\n"));
+}
+
+TEST_F(ShowTest, AReferenceIsShownAsItsPath) {
+  auto const object = JsonOf(Run({"show", "X_Link.Id=\"1\"", "--json"}))["object"];
+  EXPECT_EQ(object["properties"]["Target"]["type"], "reference");
+  EXPECT_EQ(object["properties"]["Target"]["value"], "X_Odd.Id=\"quote \\\" and \\\\ and \x1b[31m\"");
+}
+
+TEST_F(ShowTest, WhatIsNotThereIsAnError) {
+  for (std::string const path :
+       {"CIM_Nothing", "root/zep/host:CIM_Nothing", "root/other:CIM_Chassis", "CIM_Chassis.Tag=\"Chassis 7\"",
+        "CIM_Chassis.Nothing=\"1\"", "CIM_Chassis.Tag=", "", ":", "root/zep/host:", "\"", "CIM_Chassis.Tag=\"a"}) {
+    TRun const run = Run({"show", path});
+    EXPECT_EQ(run.status, 1) << path;
+    EXPECT_EQ(run.output, "") << path;
+    EXPECT_EQ(run.errors, "zep: no provider has the object \"" + path + "\"\n");
+  }
+}
+
+TEST_F(ShowTest, TheSampleIsLabelled) {
+  TRun const run = Run({"show", "--sample", "CIM_Chassis"});
+  EXPECT_THAT(run.output, testing::StartsWith("SAMPLE root/zep/host:CIM_Chassis\n"));
+  auto const document = JsonOf(Run({"show", "--sample", "--json", "CIM_Chassis"}));
+  EXPECT_EQ(document["sample"], true);
+  EXPECT_EQ(document["label"], "SAMPLE");
+  EXPECT_EQ(document["version"], 1);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,94 @@
+#include "tools/zep/Text.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+using testing::ElementsAre;
+
+TEST(TextTest, WhatATerminalWouldActUponIsEscaped) {
+  struct TRow {
+    std::string text, printable;
+  } const rows[] = {
+      {"plain text, 100 %", "plain text, 100 %"},
+      {"", ""},
+      {"\x1b[31mred", "\\x1b[31mred"},
+      {"a\nb\tc\rd", "a\\x0ab\\x09c\\x0dd"},
+      {std::string("a\0b", 3), "a\\x00b"},
+      {"\x7f", "\\x7f"},
+      {"caf\xc3\xa9 \xe2\x82\xac \xf0\x9f\x98\x80", "caf\xc3\xa9 \xe2\x82\xac \xf0\x9f\x98\x80"},
+      {"\xc2\x9b"
+       "31m",
+       "\\x9b"
+       "31m"},  // a control character of two bytes
+      {"\xe2\x80\xae"
+       "abc",
+       "\\u202e"
+       "abc"},  // writes from right to left
+      {"a\xe2\x80\x8b"
+       "b",
+       "a\\u200b"
+       "b"},  // has no width
+      {"\xef\xbb\xbf", "\\ufeff"},
+      {"\xff\xfe", "\\xff\\xfe"},
+      {"\xc3", "\\xc3"},  // cut
+      {"\xc3(", "\\xc3("},
+      {"\xc0\xaf", "\\xc0\\xaf"},  // longer than need be
+      {"\xe0\x80\xaf", "\\xe0\\x80\\xaf"},
+      {"\xed\xa0\x80", "\\xed\\xa0\\x80"},           // half of a pair
+      {"\xf4\x90\x80\x80", "\\xf4\\x90\\x80\\x80"},  // beyond the last character
+      {"\x80", "\\x80"},
+  };
+  for (TRow const& row : rows) EXPECT_EQ(Printable(row.text), row.printable) << testing::PrintToString(row.text);
+}
+
+TEST(TextTest, EveryByteBecomesPrintable) {
+  for (int byte = 0; byte < 256; ++byte) {
+    std::string const text = Printable(std::string(1, static_cast<char>(byte)));
+    for (char c : text) EXPECT_TRUE(c >= 0x20 && c < 0x7f) << byte;
+  }
+}
+
+TEST(TextTest, WidthCountsCharacters) {
+  EXPECT_EQ(WidthOf(""), 0u);
+  EXPECT_EQ(WidthOf("caf\xc3\xa9"), 4u);
+}
+
+TEST(TextTest, LongTextsAreBrokenAtBlanks) {
+  EXPECT_THAT(Wrapped("", 5), ElementsAre(""));
+  EXPECT_THAT(Wrapped("12345", 5), ElementsAre("12345"));
+  EXPECT_THAT(Wrapped("12345 789", 5), ElementsAre("12345", "789"));
+  EXPECT_THAT(Wrapped("one two three", 7), ElementsAre("one two", "three"));
+  EXPECT_THAT(Wrapped("one two three", 6), ElementsAre("one", "two", "three"));
+  EXPECT_THAT(Wrapped("1234567890", 4), ElementsAre("1234", "5678", "90"));
+  EXPECT_THAT(Wrapped("a 1234567890", 4), ElementsAre("a", "1234", "5678", "90"));
+  EXPECT_THAT(Wrapped("a    b", 2), ElementsAre("a", "b"));
+  EXPECT_THAT(Wrapped("ends in blanks   ", 14), ElementsAre("ends in blanks"));
+  EXPECT_THAT(Wrapped("\xc3\xa9\xc3\xa9\xc3\xa9", 2), ElementsAre("\xc3\xa9\xc3\xa9", "\xc3\xa9"));
+}
+
+TEST(TextTest, ATableKeepsItsColumns) {
+  TTable table({6, 8, 4});
+  table.Add({"Name", "Value", "By"});
+  table.Add({"a", "one two three", "x"});
+  table.Add({"long name", "v", "y"});
+  table.Add({"b", "", "z"});
+  EXPECT_EQ(table.GetText(),
+            "Name    Value     By\n"
+            "a       one two   x\n"
+            "        three\n"
+            "long    v         y\n"
+            "name\n"
+            "b                 z\n");
+}
+
+TEST(TextTest, CellsAreMadePrintable) {
+  TTable table({20});
+  table.Add({"\x1b[2J\n"});
+  EXPECT_EQ(table.GetText(), "\\x1b[2J\\x0a\n");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

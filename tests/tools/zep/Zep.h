@@ -1,0 +1,110 @@
+#pragma once
+
+// zep as users have it: the real program, run as a child in a copy of what an installation lays side by side.
+
+#include "tests/SmbiosTables.h"
+
+#include <fcntl.h>
+#include <grp.h>
+#include <sys/wait.h>
+#include <unistd.h>
+#include <nlohmann/json.hpp>
+
+#include <csignal>
+#include <map>
+
+namespace NQRVZEP20::zep {
+
+namespace fs = std::filesystem;
+
+struct TRun {
+  int status;  // the exit status, or 128 and the number of the signal that ended it
+  std::string output, errors;
+};
+
+// How zep is called.
+struct TCall {
+  std::vector<std::string> arguments;
+  std::map<std::string, std::string> environment = {};
+  bool asNobody = false;            // as a user without privileges
+  bool ignoresBrokenPipes = false;  // with SIGPIPE ignored, as some callers leave it
+  std::string outputFile = {};      // instead of one that is read back
+  int outputDescriptor = -1;        // the same, as an open descriptor
+  std::string directory = {};       // to work in
+};
+
+class TInstallation {
+public:
+  TInstallation() {
+    fs::permissions(dir_.Path(), fs::perms::owner_all | fs::perms::group_exec | fs::perms::others_exec | fs::perms::others_read);
+    fs::create_directory(dir_.Path("lib"));
+    fs::create_directory(dir_.Path("bin"));
+    fs::copy(TEST_BIN_DIR "/zep", dir_.Path("bin/zep"));
+    for (char const* library : {"libzepcore.so", "libsmbios.so", "libHost.nsp.so"})
+      Add(library, std::string(TEST_LIB_DIR "/") + library);
+    fs::create_directories(dir_.Path("share/zepcore"));
+    fs::copy(TEST_SHARE_DIR "/zepcore", dir_.Path("share/zepcore"), fs::copy_options::recursive);
+  }
+
+  std::string Path(std::string const& name) const { return dir_.Path(name); }
+  void Add(std::string const& library, std::string const& source) {
+    fs::copy(source, dir_.Path("lib/" + library), fs::copy_options::overwrite_existing);
+  }
+  void Remove(std::string const& library) { fs::remove(dir_.Path("lib/" + library)); }
+
+  // A table file for ZEP_SMBIOS_TABLE.
+  std::string Table(std::string const& table) {
+    WriteFile(Path("table"), table);
+    return Path("table");
+  }
+
+  TRun Run(TCall const& call) const {
+    pid_t const child = ::fork();
+    if (child == 0) Exec(call);
+    int status = 0;
+    ::waitpid(child, &status, 0);
+    return {WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status), ReadFile(Path("out")), ReadFile(Path("err"))};
+  }
+
+private:
+  [[noreturn]] void Exec(TCall const& call) const {
+    if (!RedirectTo(call.outputFile.empty() ? Path("out") : call.outputFile, STDOUT_FILENO)) ::_exit(126);
+    if (call.outputDescriptor >= 0) ::dup2(call.outputDescriptor, STDOUT_FILENO);
+    if (!RedirectTo(Path("err"), STDERR_FILENO)) ::_exit(126);
+    if (!call.directory.empty() && ::chdir(call.directory.c_str()) != 0) ::_exit(126);
+    std::signal(SIGPIPE, call.ignoresBrokenPipes ? SIG_IGN : SIG_DFL);
+    for (char const* name : {"ZEP_SMBIOS_TABLE", "ZEP_HOST_NAME", "LD_LIBRARY_PATH"}) ::unsetenv(name);
+    for (auto const& [name, value] : call.environment) ::setenv(name.c_str(), value.c_str(), 1);
+    if (call.asNobody && !BecomeNobody()) ::_exit(126);
+
+    std::string const program = Path("bin/zep");
+    std::vector<char*> arguments = {const_cast<char*>("zep")};
+    for (std::string const& argument : call.arguments) arguments.push_back(const_cast<char*>(argument.c_str()));
+    arguments.push_back(nullptr);
+    ::execv(program.c_str(), arguments.data());
+    ::_exit(127);
+  }
+
+  static bool RedirectTo(std::string const& file, int descriptor) {
+    int const fd = ::open(file.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0666);
+    return fd >= 0 && ::dup2(fd, descriptor) >= 0;
+  }
+
+  static bool BecomeNobody() {
+    constexpr unsigned nobody = 65534;
+    return ::geteuid() != 0 || (::setgroups(0, nullptr) == 0 && ::setgid(nobody) == 0 && ::setuid(nobody) == 0);
+  }
+
+  TTempDir dir_;
+};
+
+inline nlohmann::json JsonOf(TRun const& run) { return nlohmann::json::parse(run.output); }
+
+inline std::vector<std::string> LinesOf(std::string const& text) {
+  std::vector<std::string> lines;
+  std::istringstream stream(text);
+  for (std::string line; std::getline(stream, line);) lines.push_back(line);
+  return lines;
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,122 @@
+// A provider plug-in with the behaviours that the environment variable ZEP_TEST_PROVIDER names, one word after the other.
+
+#include "ICIMClass.h"
+#include "TNamespaceProviderManager.h"
+#include "TZEPException.h"
+#include "providers/memory/TMemoryNamespace.h"
+#include "providers/memory/TMemoryProvider.h"
+
+#include <boost/make_shared.hpp>
+
+#include <cstdio>
+#include <cstdlib>
+#include <iostream>
+#include <limits>
+#include <sstream>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+bool Does(std::string const& behaviour) {
+  char const* chosen = std::getenv("ZEP_TEST_PROVIDER");
+  std::istringstream words(chosen != nullptr ? chosen : "");
+  for (std::string word; words >> word;)
+    if (word == behaviour) return true;
+  return false;
+}
+
+void AddSystem(TMemoryNamespace& ns, char const* name) {
+  ns.AddInstance("QRVSG_ComputerSystem", {{"Name", name}, {"ProductName", "1234AB7"}, {"SerialNumber", "KQ12345"}});
+}
+
+void AddSystems(TMemoryNamespace& ns) {
+  ns.DefineClass("QRVSG_ComputerSystem")
+      .Key("Name", "string")
+      .Property("ProductName", "string")
+      .Property("SerialNumber", "string");
+  AddSystem(ns, "one");
+  if (Does("two-systems")) AddSystem(ns, "two");
+}
+
+// Values of every kind, and texts that a terminal or a JSON reader would stumble over.
+void AddOddities(TMemoryNamespace& ns) {
+  ns.DefineClass("X_Base").Key("Id", "string").Property("Inherited", "uint8");
+  ns.DefineClass("X_Odd", "X_Base")
+      .Property("Text", "string")
+      .Property("Bytes", "string")
+      .Property("Flag", "boolean")
+      .Property("Large", "uint64")
+      .Property("Small", "sint64")
+      .Property("Half", "real32")
+      .Property("Infinite", "real64")
+      .Property("When", "datetime")
+      .Property("List", "string[]")
+      .Property("Numbers", "uint8[4]")
+      .Property("Nothing", "uint16");
+  ns.DefineClass("X_Link").Key("Id", "string").Reference("Target", "X_Base");
+  std::vector<TCIMValue> const texts = {"a", "b, c"};
+  std::vector<TCIMValue> const numbers = {static_cast<unsigned char>(1), static_cast<unsigned char>(255)};
+  auto const odd = ns.AddInstance("X_Odd", {{"Id", "quote \" and \\ and \x1b[31m"},
+                                            {"Inherited", static_cast<unsigned char>(7)},
+                                            {"Text", "\x1b]0;title\x07 \xe2\x80\xae reversed"},
+                                            {"Bytes", "\xff\xfe no UTF-8"},
+                                            {"Flag", true},
+                                            {"Large", std::numeric_limits<unsigned long>::max()},
+                                            {"Small", std::numeric_limits<long>::min()},
+                                            {"Half", 0.5f},
+                                            {"Infinite", std::numeric_limits<double>::infinity()},
+                                            {"When", TCIMDateTime("20070315143000.000000+060")},
+                                            {"List", TCIMValue(TCIMValue::TCIMType::kCIMTypeString, 0, texts)},
+                                            {"Numbers", TCIMValue(TCIMValue::TCIMType::kCIMTypeUint8, 4, numbers)}});
+  ns.AddInstance("X_Link", {{"Id", "1"}, {"Target", odd->GetReference()}});
+}
+
+void Fill(TMemoryNamespace& ns) {
+  if (Does("prints")) std::printf("noise while filling\n");
+  if (Does("throws")) throw TZEPException(kZEPStatusAccessDenied);
+  if (Does("throws-a-number")) throw 5;
+  if (Does("two-systems") || Does("one-system")) AddSystems(ns);
+  if (Does("odd")) AddOddities(ns);
+}
+
+// Fails whenever a class is asked for by name, or all of them.
+class TFailingNamespace : public TMemoryNamespace {
+public:
+  using TMemoryNamespace::TMemoryNamespace;
+  boost::shared_ptr<ICIMClass> GetClass(std::string const& name, TCIMContext const& context) const override {
+    if (name == "ZEP_MissingValue" && !Does("fails-at-once")) return TMemoryNamespace::GetClass(name, context);
+    throw TZEPException(kZEPStatusFail);
+  }
+  void EnumerateClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)>, TCIMContext const&) const override { throw 5; }
+};
+
+class TOwnProvider : public INamespaceProvider {
+public:
+  std::string const& GetName(TCIMContext const&) const override { return fName; }
+  boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const&) override {
+    if (Does("no-namespace")) return {};
+    return fNamespace;
+  }
+
+private:
+  std::string const fName = "Test";
+  boost::shared_ptr<ICIMNamespace> const fNamespace = boost::make_shared<TFailingNamespace>("root/failing");
+};
+
+boost::shared_ptr<INamespaceProvider> MakeProvider() {
+  if (Does("no-namespace") || Does("fails-at-once") || Does("fails-later")) return boost::make_shared<TOwnProvider>();
+  return boost::make_shared<TMemoryProvider>(Does("calls-itself-host") ? "Host" : "Test", "root/test", Fill);
+}
+
+struct TRegistration {
+  TRegistration() {
+    if (Does("prints")) std::cout << "noise while loading" << std::endl;
+    if (Does("is-silent")) return;
+    TNamespaceProviderManager::GetInstance()->RegisterNamespaceProvider(MakeProvider());
+  }
+} const gRegistration;
+
+}  // namespace
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,26 @@
+#pragma once
+
+#include <functional>
+
+namespace CLI {
+class App;
+}
+
+namespace NQRVZEP20::zep {
+
+// What a command does once its arguments are read; returns an EExitStatus.
+using TRun = std::function<int()>;
+
+// Each adds its command to the program, with its arguments. One file for each; main.cpp has the table of them.
+struct TCommand {
+  char const* fName;
+  char const* fDescription;
+  TRun (*fAddArguments)(CLI::App& command);
+};
+
+TRun AddConfigArguments(CLI::App& command);  // ConfigCommand.cpp
+TRun AddReportArguments(CLI::App& command);  // ReportCommand.cpp
+TRun AddRunArguments(CLI::App& command);     // RunCommand.cpp
+TRun AddShowArguments(CLI::App& command);    // ShowCommand.cpp
+
+}  // namespace NQRVZEP20::zep

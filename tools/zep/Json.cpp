@@ -1,0 +1,94 @@
+#include "Json.h"
+
+#include "ICIMClass.h"
+#include "ICIMInstance.h"
+#include "ICIMProperty.h"
+#include "ICIMPropertyDecl.h"
+#include "Sample.h"
+
+#include <cmath>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+using TType = TCIMValue::TCIMType;
+
+TJson RealAsJson(double real, std::string const& text) { return std::isfinite(real) ? TJson(real) : TJson(text); }
+
+TJson ArrayAsJson(std::vector<TCIMValue> const& elements) {
+  TJson array = TJson::array();
+  for (TCIMValue const& element : elements) array.push_back(ValueAsJson(element));
+  return array;
+}
+
+TJson PropertyAsJson(TNamespaceView const& view, ICIMInstance const& instance, ICIMProperty const& property) {
+  TCIMValue const value = property.GetValue(TCIMContext());
+  TJson json = {{"type", NameOf(value.GetType())}, {"value", ValueAsJson(value)}};
+  auto const declaration = property.GetDeclaration(TCIMContext());
+  if (declaration->IsKey(TCIMContext())) json["key"] = true;
+  json["source"] = view.SourceOf(*declaration);
+  if (value.IsNull()) {
+    TMissing const why = view.WhyMissing(instance, property.GetName(TCIMContext()));
+    json["code"] = why.fCode;
+    json["reason"] = why.fReason;
+  }
+  return json;
+}
+
+}  // namespace
+
+TJson DocumentHead(std::string const& what) {
+  TJson document = {{"document", what}, {"version", kDocumentVersion}, {"zep", ZEP_VERSION}, {"sample", IsSampleSelected()}};
+  if (IsSampleSelected()) document["label"] = kSampleLabel;
+  return document;
+}
+
+std::string AsText(TJson const& document) { return document.dump(2, ' ', false, TJson::error_handler_t::replace) + "\n"; }
+
+TJson ValueAsJson(TCIMValue const& value) {
+  if (value.IsNull()) return nullptr;
+  if (value.IsArray()) return ArrayAsJson(static_cast<std::vector<TCIMValue>&>(value));
+  switch (value.GetType()) {
+    case TType::kCIMTypeBoolean:
+      return static_cast<bool>(value);
+    case TType::kCIMTypeUint8:
+    case TType::kCIMTypeUint16:
+    case TType::kCIMTypeUint32:
+    case TType::kCIMTypeUint64:
+      return std::stoull(value.ToString());
+    case TType::kCIMTypeSint8:
+    case TType::kCIMTypeSint16:
+    case TType::kCIMTypeSint32:
+    case TType::kCIMTypeSint64:
+      return std::stoll(value.ToString());
+    case TType::kCIMTypeReal32:
+      return RealAsJson(static_cast<float>(value), value.ToString());
+    case TType::kCIMTypeReal64:
+      return RealAsJson(static_cast<double>(value), value.ToString());
+    default:
+      return value.ToString();
+  }
+}
+
+std::string NameOf(TCIMValue::TCIMType type) {
+  if (type == TType::kCIMTypeInvalid) return "none";
+  return type.ToString() + ((type & TType::kCIMTypeArrayFlag) != 0 ? "[]" : "");
+}
+
+TJson InstanceAsJson(TNamespaceView const& view, ICIMInstance const& instance) {
+  TJson properties = TJson::object();
+  instance.EnumerateProperties(
+      [&](boost::shared_ptr<ICIMProperty> property) {
+        properties[property->GetName(TCIMContext())] = PropertyAsJson(view, instance, *property);
+        return true;
+      },
+      TCIMContext());
+  return {{"path", view.PathOf(instance)},
+          {"provider", view.GetProviderName()},
+          {"namespace", view.GetName()},
+          {"class", instance.GetClass(TCIMContext())->GetName(TCIMContext())},
+          {"properties", properties}};
+}
+
+}  // namespace NQRVZEP20::zep

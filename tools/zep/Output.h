@@ -1,0 +1,24 @@
+#pragma once
+
+#include <string>
+
+namespace NQRVZEP20::zep {
+
+// Writes the text to standard output, whole. Throws std::system_error when that fails, as on a full disk; a reader who
+// went away ends the program by SIGPIPE, unless the caller of zep has that signal ignored.
+void WriteOutput(std::string const& text);
+
+// For as long as it lives, what anyone else in this process prints to standard output goes to standard error: plug-ins
+// must not write into a document.
+class TOutputGuard {
+public:
+  TOutputGuard();
+  ~TOutputGuard();
+  TOutputGuard(TOutputGuard const&) = delete;
+  TOutputGuard& operator=(TOutputGuard const&) = delete;
+
+private:
+  int fOutput;  // the real standard output; -1 when there is none
+};
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,262 @@
+#include "Report.h"
+
+#include "Failure.h"
+#include "ICIMClass.h"
+#include "ICIMInstance.h"
+#include "ICIMProperty.h"
+#include "Sample.h"
+#include "TCIMSchemaHelper.h"
+#include "TZEPException.h"
+
+#include <algorithm>
+#include <cstdio>
+#include <cstdlib>
+#include <map>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+using TNamespacePtr = boost::shared_ptr<ICIMNamespace>;
+using TViews = std::vector<TNamespaceView>;
+
+// ---- Asking ----
+
+// What one row of the identity asks, and the property that the answer comes from.
+struct TQuestion {
+  char const* key;
+  char const* label;
+  char const* className;
+  char const* property;
+  std::string (*ask)(TNamespacePtr ns);
+};
+
+constexpr char const* kSystem = "QRVSG_ComputerSystem";
+constexpr char const* kOperatingSystem = "QRVSG_OperatingSystem";
+constexpr char const* kProduct = "QRVSG_ZEPProduct";
+constexpr char const* kUnknownModel = "xxx";  // what the helper answers when the product name has no model
+
+TQuestion const kIdentity[] = {
+    {"hostName", "Host name", kSystem, "Name", TCIMSchemaHelper::GetSystemName},
+    {"productName", "Product name", kSystem, "ProductName", TCIMSchemaHelper::GetSystemProductName},
+    {"machineType", "Machine type", kSystem, "ProductName", TCIMSchemaHelper::GetMachineType},
+    {"model", "Model", kSystem, "ProductName", TCIMSchemaHelper::GetModelNumber},
+    {"serialNumber", "Serial number", kSystem, "SerialNumber",
+     [](TNamespacePtr ns) { return TCIMSchemaHelper::GetSerialNumber(ns, TCIMContext()); }},
+    {"osName", "OS", kOperatingSystem, "Name", TCIMSchemaHelper::GetOperatingSystemName},
+    {"osVersion", "OS version", kOperatingSystem, "Version", TCIMSchemaHelper::GetOperatingSystemVersion},
+    {"osType", "OS type", kOperatingSystem, "OSType", TCIMSchemaHelper::GetOperatingSystemType},
+    {"collectorVersion", "zepcore version", kProduct, "Version",
+     [](TNamespacePtr ns) { return TCIMSchemaHelper::GetDataSourceVersion(ns, TCIMContext()); }},
+    {"collectorBuild", "zepcore build", kProduct, "Build",
+     [](TNamespacePtr ns) { return TCIMSchemaHelper::GetDataSourceBuild(ns, TCIMContext()); }},
+};
+
+bool IsBlank(std::string const& text) { return text.find_first_not_of(" \t") == std::string::npos; }
+
+// What the helper answers; where it refuses, the reason is looked for in the property itself.
+TAnswer Ask(TNamespaceView const& view, TQuestion const& question) {
+  auto const instances = view.InstancesOf(question.className);
+  if (instances.empty()) return view.AnswerWithoutInstance(question.className, question.property);
+  if (instances.size() > 1)
+    return TAnswer::Unknown({kMissingUnexpected, "the provider describes " + std::to_string(instances.size()) + " of them"}, "");
+
+  TAnswer const raw = view.Answer(*instances.front(), question.property);
+  if (!raw.fIsKnown) return raw;
+  try {
+    std::string const text = question.ask(view.Get());
+    if (IsBlank(text)) return TAnswer::Unknown({kMissingNotGiven, "the provider gives a blank text"}, raw.fSource);
+    return TAnswer::Known(text, raw.fSource);
+  } catch (TZEPException const& failure) {
+    EZEPStatusCode const status = failure.GetStatusCode().GetCode();
+    if (status != kZEPStatusInvalidFormat && status != kZEPStatusTypeMismatch) throw;
+    return TAnswer::Unknown({kMissingUnexpected, "not in the expected form: \"" + raw.fValue + "\""}, raw.fSource);
+  }
+}
+
+TAnswer AskForModel(TNamespaceView const& view, TQuestion const& question) {
+  TAnswer const answer = Ask(view, question);
+  if (!answer.fIsKnown || answer.fValue != kUnknownModel) return answer;
+  return TAnswer::Unknown({kMissingNotGiven, "the product name tells the machine type only"}, answer.fSource);
+}
+
+TMissing WhyNobodyAnswers(std::vector<TPlugIn> const& plugIns) {
+  if (plugIns.empty()) return {kMissingNotDescribed, "no provider plug-in found"};
+  return {kMissingNotDescribed, "no provider plug-in works"};
+}
+
+// The first answer of a provider that knows, else the most telling of the others.
+template <class TAsk>
+TAnswer AskEveryone(TViews const& views, std::vector<TPlugIn> const& plugIns, TAsk ask) {
+  TAnswer best = TAnswer::Unknown(WhyNobodyAnswers(plugIns), "");
+  for (TNamespaceView const& view : views) {
+    TAnswer answer = TAnswer::Unknown({}, "");
+    std::string const failure = FailureOf([&] { answer = ask(view); });
+    if (!failure.empty())
+      answer = TAnswer::Unknown({kMissingProviderFailed, "provider " + view.GetProviderName() + " failed: " + failure}, "");
+    if (answer.fIsKnown) return answer;
+    if (best.fMissing.fCode == kMissingNotDescribed) best = answer;
+  }
+  return best;
+}
+
+// ---- Details ----
+
+TAnswer PropertyOfFirst(TNamespaceView const& view, char const* className, char const* property) {
+  auto const instances = view.InstancesOf(className);
+  if (instances.empty()) return view.AnswerWithoutInstance(className, property);
+  return view.Answer(*instances.front(), property);
+}
+
+TAnswer BiosDate(TNamespaceView const& view) {
+  auto const instances = view.InstancesOf("CIM_BIOSElement");
+  if (instances.empty()) return view.AnswerWithoutInstance("CIM_BIOSElement", "ReleaseDate");
+  TAnswer answer = view.Answer(*instances.front(), "ReleaseDate");
+  if (!answer.fIsKnown) return answer;
+  TCIMDateTime const date = instances.front()->GetProperty("ReleaseDate", TCIMContext())->GetValue(TCIMContext());
+  char text[32];
+  std::snprintf(text, sizeof text, "%04u-%02u-%02u", date.GetYear(), date.GetMonth(), date.GetDay());
+  return TAnswer::Known(text, answer.fSource);
+}
+
+// "2 x Example Processor, 24 cores"
+TAnswer Processors(TNamespaceView const& view) {
+  auto const processors = view.InstancesOf("CIM_Processor");
+  if (processors.empty()) return view.AnswerWithoutInstance("CIM_Processor", "ElementName");
+  std::map<std::string, unsigned> countOfKind;
+  unsigned long cores = 0;
+  bool areCoresKnown = true;
+  std::string source;
+  for (auto const& processor : processors) {
+    TAnswer const kind = view.Answer(*processor, "ElementName");
+    TAnswer const number = view.Answer(*processor, "NumberOfEnabledCores");
+    ++countOfKind[kind.fIsKnown ? kind.fValue : "processor of unknown kind"];
+    if (number.fIsKnown) cores += std::strtoul(number.fValue.c_str(), nullptr, 10);
+    areCoresKnown = areCoresKnown && number.fIsKnown;
+    source = kind.fSource;
+  }
+  std::string text;
+  for (auto const& [kind, count] : countOfKind) text += (text.empty() ? "" : ", ") + std::to_string(count) + " x " + kind;
+  if (areCoresKnown) text += ", " + std::to_string(cores) + (cores == 1 ? " core" : " cores");
+  return TAnswer::Known(text, source);
+}
+
+std::string AsSize(unsigned long bytes) {
+  constexpr char const* units[] = {"bytes", "KiB", "MiB", "GiB", "TiB"};
+  std::size_t unit = 0;
+  for (; unit + 1 < std::size(units) && bytes >= 1024 && bytes % 1024 == 0; ++unit) bytes /= 1024;
+  return std::to_string(bytes) + " " + units[unit];
+}
+
+// "128 GiB in 8 modules"
+TAnswer Memory(TNamespaceView const& view) {
+  auto const modules = view.InstancesOf("CIM_PhysicalMemory");
+  if (modules.empty()) return view.AnswerWithoutInstance("CIM_PhysicalMemory", "Capacity");
+  unsigned long bytes = 0, unknown = 0;
+  TAnswer capacity = TAnswer::Unknown({}, "");
+  for (auto const& module : modules) {
+    capacity = view.Answer(*module, "Capacity");
+    if (capacity.fIsKnown)
+      bytes += std::strtoul(capacity.fValue.c_str(), nullptr, 10);
+    else
+      ++unknown;
+  }
+  if (unknown == modules.size()) return capacity;
+  std::string text = AsSize(bytes) + " in " + std::to_string(modules.size()) + (modules.size() == 1 ? " module" : " modules");
+  if (unknown > 0) text += ", " + std::to_string(unknown) + " of them of unknown size";
+  return TAnswer::Known(text, capacity.fSource);
+}
+
+struct TDetail {
+  char const* key;
+  char const* label;
+  TAnswer (*ask)(TNamespaceView const& view);
+};
+
+constexpr TDetail kDetails[] = {
+    {"manufacturer", "Manufacturer", [](TNamespaceView const& view) { return PropertyOfFirst(view, kSystem, "Manufacturer"); }},
+    {"uuid", "UUID", [](TNamespaceView const& view) { return PropertyOfFirst(view, kSystem, "UUID"); }},
+    {"biosVersion", "BIOS version",
+     [](TNamespaceView const& view) { return PropertyOfFirst(view, "CIM_BIOSElement", "Version"); }},
+    {"biosDate", "BIOS date", BiosDate},
+    {"chassis", "Chassis",
+     [](TNamespaceView const& view) { return PropertyOfFirst(view, "CIM_Chassis", "ChassisTypeDescription"); }},
+    {"processors", "Processors", Processors},
+    {"memory", "Memory", Memory},
+    {"kernel", "Kernel", [](TNamespaceView const& view) { return PropertyOfFirst(view, kOperatingSystem, "KernelRelease"); }},
+    {"architecture", "Architecture",
+     [](TNamespaceView const& view) { return PropertyOfFirst(view, kOperatingSystem, "Architecture"); }},
+};
+
+// ---- Head lines ----
+
+TAnswer const& Row(std::vector<TReportRow> const& rows, std::string const& key) {
+  return std::find_if(rows.begin(), rows.end(), [&](TReportRow const& row) { return row.fKey == key; })->fAnswer;
+}
+
+std::string ValueOr(TAnswer const& answer, std::string const& otherwise) { return answer.fIsKnown ? answer.fValue : otherwise; }
+
+// Without the brackets with type and model, which the line tells by themselves.
+std::string WithoutTypeAndModel(std::string const& productName) {
+  std::string const name = productName.substr(0, productName.find("-["));
+  std::size_t const last = name.find_last_not_of(' ');
+  return last == std::string::npos ? productName : name.substr(0, last + 1);
+}
+
+std::string MachineLine(std::vector<TReportRow> const& identity) {
+  TAnswer const& product = Row(identity, "productName");
+  TAnswer const& type = Row(identity, "machineType");
+  TAnswer const& serial = Row(identity, "serialNumber");
+  std::string const host = ValueOr(Row(identity, "hostName"), "Unnamed machine");
+  if (!product.fIsKnown && !type.fIsKnown && !serial.fIsKnown && product.fMissing.fReason == serial.fMissing.fReason)
+    return host + ": not identified: " + product.fMissing.fReason;
+  return host + ": " + (product.fIsKnown ? WithoutTypeAndModel(product.fValue) : "unknown product") + ", type " +
+         ValueOr(type, "unknown") + ", model " + ValueOr(Row(identity, "model"), "unknown") + ", serial number " +
+         ValueOr(serial, "unknown");
+}
+
+std::string OperatingSystemLine(TReport const& report) {
+  TAnswer const& name = Row(report.fIdentity, "osName");
+  TAnswer const& version = Row(report.fIdentity, "osVersion");
+  TAnswer const& type = Row(report.fIdentity, "osType");
+  TAnswer const& kernel = Row(report.fDetails, "kernel");
+  std::string line = IsSampleSelected() ? "operating system of this machine, not of the sample: " : "Operating system: ";
+  line += name.fIsKnown ? name.fValue + (version.fIsKnown ? " " + version.fValue : "") : "unknown: " + name.fMissing.fReason;
+  if (type.fIsKnown && kernel.fIsKnown) line += ", " + type.fValue + " " + kernel.fValue;
+  return line;
+}
+
+std::vector<std::string> HeadLines(TReport const& report) {
+  std::string const label = IsSampleSelected() ? std::string(kSampleLabel) + " " : "";
+  return {label + MachineLine(report.fIdentity), label + OperatingSystemLine(report)};
+}
+
+EExitStatus StatusOf(TReport const& report) {
+  auto const isKnown = [](TReportRow const& row) { return row.fAnswer.fIsKnown; };
+  bool const areAllKnown = std::all_of(report.fIdentity.begin(), report.fIdentity.end(), isKnown);
+  bool const isAnyKnown = std::any_of(report.fIdentity.begin(), report.fIdentity.end(), isKnown);
+  bool const hasAnyFailed =
+      std::any_of(report.fPlugIns.begin(), report.fPlugIns.end(), [](TPlugIn const& plugIn) { return plugIn.HasFailed(); });
+  if (!isAnyKnown) return kExitNothing;
+  return areAllKnown && !hasAnyFailed ? kExitComplete : kExitPartial;
+}
+
+}  // namespace
+
+TReport MakeReport(std::vector<TPlugIn> plugIns) {
+  TReport report;
+  report.fPlugIns = std::move(plugIns);
+  TViews const views = ViewsOf(report.fPlugIns);
+  for (TQuestion const& question : kIdentity) {
+    auto const ask = question.key == std::string("model") ? AskForModel : Ask;
+    auto const askView = [&](TNamespaceView const& view) { return ask(view, question); };
+    report.fIdentity.push_back({question.key, question.label, AskEveryone(views, report.fPlugIns, askView)});
+  }
+  for (TDetail const& row : kDetails)
+    report.fDetails.push_back({row.key, row.label, AskEveryone(views, report.fPlugIns, row.ask)});
+  report.fHead = HeadLines(report);
+  report.fStatus = StatusOf(report);
+  return report;
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,37 @@
+#pragma once
+
+#include "ExitStatus.h"
+#include "PlugIns.h"
+#include "TNamespaceView.h"
+
+#include <string>
+#include <vector>
+
+namespace NQRVZEP20::zep {
+
+struct TReportRow {
+  std::string fKey;    // for programs: "serialNumber"
+  std::string fLabel;  // for people: "Serial number"
+  TAnswer fAnswer;
+};
+
+// Which machine this is, as the providers tell it.
+struct TReport {
+  std::vector<std::string> fHead;  // two lines: the machine, its operating system
+  std::vector<TReportRow> fIdentity;
+  std::vector<TReportRow> fDetails;
+  std::vector<TPlugIn> fPlugIns;
+
+  // Complete: every row of the identity is known and no plug-in failed. Nothing: no row of the identity is known. The
+  // details do not count.
+  EExitStatus fStatus;
+};
+
+TReport MakeReport(std::vector<TPlugIn> plugIns);
+
+std::string ReportAsText(TReport const& report);  // ReportText.cpp
+
+// One JSON document, with every instance of every namespace besides (ReportJson.cpp).
+std::string ReportAsJson(TReport const& report);
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,35 @@
+#pragma once
+
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace NQRVZEP20::zep {
+
+// Text that is safe on a terminal. What comes from firmware or a plug-in may hold anything: control characters, characters
+// that change the direction of writing, and bytes that are no UTF-8 are written as "\x1b" or "\u202e".
+std::string Printable(std::string_view text);
+
+// How many characters a printable text has. Each counts as one column.
+std::size_t WidthOf(std::string_view text);
+
+// Lines of at most `width` characters, broken at blanks where that is possible; at least one line.
+std::vector<std::string> Wrapped(std::string_view text, std::size_t width);
+
+// A table with a title line and columns of fixed widths, two blanks apart. A cell that is too long goes on in the next
+// line. Cells are made printable here.
+class TTable {
+public:
+  explicit TTable(std::vector<std::size_t> widths) : fWidths(std::move(widths)) {}
+
+  void Add(std::vector<std::string> const& cells);
+  std::string const& GetText() const { return fText; }
+
+private:
+  std::vector<std::size_t> fWidths;
+  std::string fText;
+};
+
+constexpr std::size_t kLineWidth = 80;
+
+}  // namespace NQRVZEP20::zep
