@@ -2,6 +2,7 @@
 
 #include "TCIMNumericValueImpl.h"
 #include "TZEPException.h"
+#include "cim/value/IntegerText.h"
 
 #include <string_view>
 
@@ -23,7 +24,6 @@ TCIMArrayValueImpl::operator std::vector<TCIMValue>&() const { return fElements;
 
 // The elements are written to where they stay: numbers, which most arrays hold, without a string of their own.
 std::string TCIMArrayValueImpl::ToString(unsigned char radix) const {
-  constexpr std::size_t kRoomForNumber = 32;
   std::string text = "{ ";
   std::size_t length = text.size();
   auto const makeRoom = [&](std::size_t room) {
@@ -33,9 +33,9 @@ std::string TCIMArrayValueImpl::ToString(unsigned char radix) const {
   auto const put = [&](std::string_view piece) { length += piece.copy(makeRoom(piece.size()), piece.size()); };
 
   for (TCIMValue const& element : fElements) {
-    if (length > 2) put(", ");
+    if (&element != &fElements.front()) put(", ");
     if (IsNumber(element)) {
-      char* const place = makeRoom(kRoomForNumber);
+      char* const place = makeRoom(kRoomForInteger);
       length += static_cast<std::size_t>(DataOf<TCIMNumericValueImpl>(element).PutText(place, radix) - place);
     } else {
       put(element.ToString(radix));

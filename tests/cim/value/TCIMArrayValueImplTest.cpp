@@ -32,6 +32,17 @@ TEST(TCIMArrayValueImplTest, AnEmptyArrayKeepsBothBlanks) {
 TEST(TCIMArrayValueImplTest, StringsAreNotQuoted) {
   EXPECT_EQ(TImpl(TElements{"a, b"}).ToString(10), TImpl(TElements{"a", "b"}).ToString(10));
   EXPECT_EQ(TImpl(TElements{""}).ToString(10), "{  }");
+  EXPECT_EQ(TImpl(TElements{"", "b", ""}).ToString(10), "{ , b,  }");
+}
+
+TEST(TCIMArrayValueImplTest, PrintsElementsOfEveryLength) {
+  std::string expected = "{ ";
+  TElements elements;
+  for (unsigned long number = 1, i = 0; i < 300; ++i, number = number * 3 + i) {
+    elements.push_back(i % 3 == 0 ? TCIMValue(std::string(i, 'x')) : i % 3 == 1 ? TCIMValue(number) : TCIMValue(TCIMChar16(i)));
+    expected += (i == 0 ? "" : ", ") + elements.back().ToString();
+  }
+  EXPECT_EQ(TImpl(elements).ToString(10), expected + " }");
 }
 
 TEST(TCIMArrayValueImplTest, AnArrayInAnArrayPrintsItsOwnBraces) {

@@ -183,8 +183,8 @@ template <class TNumber>
 std::string StreamText(TNumber number, int radix = 10) {
   std::ostringstream stream;
   stream.imbue(std::locale::classic());
-  stream << std::setbase(radix) << (radix == 16 ? std::uppercase : std::nouppercase) << std::setfill('0') << std::setw(radix == 16 ? 2 * sizeof number : 0)
-         << +number;
+  stream << std::setbase(radix) << (radix == 16 ? std::uppercase : std::nouppercase) << std::setfill('0')
+         << std::setw(radix == 16 ? 2 * sizeof number : 0) << +number;
   return stream.str();
 }
 
@@ -217,17 +217,31 @@ TEST(TCIMNumericValueImplTest, IntegersPrintAsAStreamPrintsThem) {
   for (int i = 0; i < 20000; ++i) ExpectStreamTextOfEachType(random() >> random() % 64);
 }
 
+double RealFrom(std::uint64_t bits) {
+  double number;
+  std::memcpy(&number, &bits, sizeof number);
+  return number;
+}
+
 TEST(TCIMNumericValueImplTest, RealsPrintAsAStreamPrintsThem) {
   std::mt19937_64 random(20070315);
   for (int i = 0; i < 100000; ++i) {
-    std::uint64_t const bits = random();
-    double number;
-    std::memcpy(&number, &bits, sizeof number);
-    ASSERT_EQ(TImpl(number).ToString(10), StreamText(number)) << std::hexfloat << number;
-
-    auto const single = static_cast<float>(number);
-    ASSERT_EQ(TImpl(single).ToString(10), StreamText(single)) << std::hexfloat << single;
+    double const any = RealFrom(random());
+    double const common = RealFrom((1023 - 80 + random() % 160) << 52 | random() >> 12);  // from 1e-24 to 1e24
+    for (double const number : {any, common, -common, static_cast<double>(static_cast<float>(common))}) {
+      ASSERT_EQ(TImpl(number).ToString(10), StreamText(number)) << std::hexfloat << number;
+      ASSERT_EQ(TImpl(static_cast<float>(number)).ToString(10), StreamText(static_cast<float>(number)))
+          << std::hexfloat << number;
+    }
   }
+}
+
+// Where the number of digits before the point changes, and where the binary exponent does.
+TEST(TCIMNumericValueImplTest, PowersPrintAsAStreamPrintsThem) {
+  for (int exponent = -330; exponent <= 310; ++exponent)
+    for (double const power : {std::pow(10.0, exponent), std::ldexp(1.0, exponent)})
+      for (double const near : {power, std::nextafter(power, kInfinity), std::nextafter(power, -kInfinity), 9.999995 * power})
+        ASSERT_EQ(TImpl(near).ToString(10), StreamText(near)) << std::hexfloat << near;
 }
 
 // Numbers with few decimal digits: near them the sixth digit is decided by what is really stored.
