@@ -46,17 +46,18 @@ private:
   char fPath[32] = "/tmp/zep-config-bench.XXXXXX";
 };
 
-void Settings_Zep(benchmark::State& state) {
-  TSettingsDirectory const directory(state.range(0) == 1);
+void ReadByZep(benchmark::State& state, bool inOrder) {
+  TSettingsDirectory const directory(inOrder);
   for (auto _ : state) {
     TConfig config;
     if (config.getValue("collector.setting.123456").empty()) throw std::runtime_error("settings lost");
   }
 }
-BENCHMARK(Settings_Zep)->ArgName("inOrder")->Arg(1)->Arg(0);
+BENCHMARK_CAPTURE(ReadByZep, InOrder, true)->Name("SettingsInOrder_Zep");
+BENCHMARK_CAPTURE(ReadByZep, InAnyOrder, false)->Name("SettingsInAnyOrder_Zep");
 
-void Settings_GKeyFile(benchmark::State& state) {
-  TSettingsDirectory const directory(state.range(0) == 1);
+void ReadByGKeyFile(benchmark::State& state, bool inOrder) {
+  TSettingsDirectory const directory(inOrder);
   for (auto _ : state) {
     GKeyFile* const file = g_key_file_new();
     g_key_file_load_from_file(file, "zep.ini", G_KEY_FILE_NONE, nullptr);
@@ -66,6 +67,7 @@ void Settings_GKeyFile(benchmark::State& state) {
     g_key_file_free(file);
   }
 }
-BENCHMARK(Settings_GKeyFile)->ArgName("inOrder")->Arg(1)->Arg(0);
+BENCHMARK_CAPTURE(ReadByGKeyFile, InOrder, true)->Name("SettingsInOrder_GKeyFile");
+BENCHMARK_CAPTURE(ReadByGKeyFile, InAnyOrder, false)->Name("SettingsInAnyOrder_GKeyFile");
 
 }  // namespace

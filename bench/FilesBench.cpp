@@ -113,19 +113,19 @@ void ReadGibibyte(benchmark::State& state, TReadSize read) {
   for (auto _ : state)
     if (read(path.c_str()) != kGibibyte) throw std::runtime_error("contents lost");
 }
-BENCHMARK_CAPTURE(ReadGibibyte, Zep, SizeByZep)->UseRealTime()->Iterations(5);
+BENCHMARK_CAPTURE(ReadGibibyte, Zep, SizeByZep)->Name("ReadGibibyte_Zep")->UseRealTime()->Iterations(2);
 #ifdef ZEP_HAS_QT
-BENCHMARK_CAPTURE(ReadGibibyte, QFile, SizeByQFile)->UseRealTime()->Iterations(5);
+BENCHMARK_CAPTURE(ReadGibibyte, QFile, SizeByQFile)->Name("ReadGibibyte_QFile")->UseRealTime()->Iterations(2);
 #endif
-BENCHMARK_CAPTURE(ReadGibibyte, GLib, SizeByGLib)->UseRealTime()->Iterations(5);
-BENCHMARK_CAPTURE(ReadGibibyte, ifstream, SizeByIfstream)->UseRealTime()->Iterations(5);
+BENCHMARK_CAPTURE(ReadGibibyte, GLib, SizeByGLib)->Name("ReadGibibyte_GLib")->UseRealTime()->Iterations(2);
+BENCHMARK_CAPTURE(ReadGibibyte, ifstream, SizeByIfstream)->Name("ReadGibibyte_ifstream")->UseRealTime()->Iterations(2);
 
 void ReadMeminfo(benchmark::State& state, TReadSize read) {
   for (auto _ : state)
     if (read("/proc/meminfo") == 0) throw std::runtime_error("contents lost");
 }
-BENCHMARK_CAPTURE(ReadMeminfo, Zep, SizeByZep);
-BENCHMARK_CAPTURE(ReadMeminfo, fread, SizeByFread);
+BENCHMARK_CAPTURE(ReadMeminfo, Zep, SizeByZep)->Name("ReadMeminfo_Zep");
+BENCHMARK_CAPTURE(ReadMeminfo, fread, SizeByFread)->Name("ReadMeminfo_fread");
 
 // ---- Copying ----
 
@@ -152,13 +152,13 @@ void Copy(benchmark::State& state, std::string const& from, TCopy copy) {
 }
 
 void CopyGibibyte(benchmark::State& state, TCopy copy) { Copy(state, gWorkshop.LargeFile(), copy); }
-BENCHMARK_CAPTURE(CopyGibibyte, Zep, CopyByZep)->UseRealTime()->Iterations(5);
-BENCHMARK_CAPTURE(CopyGibibyte, filesystem, CopyByStandard)->UseRealTime()->Iterations(5);
-BENCHMARK_CAPTURE(CopyGibibyte, cp, CopyByCp)->UseRealTime()->Iterations(5);
+BENCHMARK_CAPTURE(CopyGibibyte, Zep, CopyByZep)->Name("CopyGibibyte_Zep")->UseRealTime()->Iterations(2);
+BENCHMARK_CAPTURE(CopyGibibyte, filesystem, CopyByStandard)->Name("CopyGibibyte_filesystem")->UseRealTime()->Iterations(2);
+BENCHMARK_CAPTURE(CopyGibibyte, cp, CopyByCp)->Name("CopyGibibyte_cp")->UseRealTime()->Iterations(2);
 
 void CopyTree(benchmark::State& state, TCopy copy) { Copy(state, gWorkshop.Tree(), copy); }
-BENCHMARK_CAPTURE(CopyTree, Zep, CopyTreeByZep)->UseRealTime()->Iterations(5);
-BENCHMARK_CAPTURE(CopyTree, cp, CopyByCp)->UseRealTime()->Iterations(5);
+BENCHMARK_CAPTURE(CopyTree, Zep, CopyTreeByZep)->Name("CopyTree_Zep")->UseRealTime()->Iterations(2);
+BENCHMARK_CAPTURE(CopyTree, cp, CopyByCp)->Name("CopyTree_cp")->UseRealTime()->Iterations(2);
 
 // ---- Listing ----
 
@@ -177,8 +177,8 @@ void List(benchmark::State& state, std::vector<std::string> (*names)(std::string
   for (auto _ : state)
     if (names(path).size() != 10000) throw std::runtime_error("names lost");
 }
-BENCHMARK_CAPTURE(List, Zep, NamesByZep);
-BENCHMARK_CAPTURE(List, GDir, NamesByGDir);
+BENCHMARK_CAPTURE(List, Zep, NamesByZep)->Name("List_Zep");
+BENCHMARK_CAPTURE(List, GDir, NamesByGDir)->Name("List_GDir");
 
 // Without a place for the names.
 void List_GDirNamesOnly(benchmark::State& state) {

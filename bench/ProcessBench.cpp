@@ -73,10 +73,10 @@ using TCapture = std::string (*)(std::string const&, std::vector<std::string> co
 void Spawn(benchmark::State& state, TCapture capture) {
   for (auto _ : state) benchmark::DoNotOptimize(capture("/bin/true", {}));
 }
-BENCHMARK_CAPTURE(Spawn, Zep, CaptureByZep)->UseRealTime();
-BENCHMARK_CAPTURE(Spawn, GSpawn, CaptureByGSpawn)->UseRealTime();
-BENCHMARK_CAPTURE(Spawn, BoostProcess, CaptureByBoost)->UseRealTime();
-BENCHMARK_CAPTURE(Spawn, Popen, CaptureByPopen)->UseRealTime();
+BENCHMARK_CAPTURE(Spawn, Zep, CaptureByZep)->Name("Spawn_Zep")->UseRealTime();
+BENCHMARK_CAPTURE(Spawn, GSpawn, CaptureByGSpawn)->Name("Spawn_GSpawn")->UseRealTime();
+BENCHMARK_CAPTURE(Spawn, BoostProcess, CaptureByBoost)->Name("Spawn_BoostProcess")->UseRealTime();
+BENCHMARK_CAPTURE(Spawn, Popen, CaptureByPopen)->Name("Spawn_Popen")->UseRealTime();
 
 void CaptureTenMegabytes(benchmark::State& state, TCapture capture) {
   char directory[] = "/tmp/zep-process-bench.XXXXXX";
@@ -89,17 +89,25 @@ void CaptureTenMegabytes(benchmark::State& state, TCapture capture) {
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * kSize));
   std::filesystem::remove_all(directory);
 }
-BENCHMARK_CAPTURE(CaptureTenMegabytes, Zep, CaptureByZep)->UseRealTime();
-BENCHMARK_CAPTURE(CaptureTenMegabytes, Popen, CaptureByPopen)->UseRealTime();
+BENCHMARK_CAPTURE(CaptureTenMegabytes, Zep, CaptureByZep)->Name("CaptureTenMegabytes_Zep")->UseRealTime();
+BENCHMARK_CAPTURE(CaptureTenMegabytes, Popen, CaptureByPopen)->Name("CaptureTenMegabytes_Popen")->UseRealTime();
 
-// Last, because the memory stays.
 void SpawnFromALargeParent(benchmark::State& state, TCapture capture) {
-  static std::vector<char> const twoGigabytes(std::size_t{2} << 30, 'x');
+  std::vector<char> const twoGibibytes(std::size_t{2} << 30, 'x');
   for (auto _ : state) benchmark::DoNotOptimize(capture("/bin/true", {}));
 }
-BENCHMARK_CAPTURE(SpawnFromALargeParent, Zep, CaptureByZep)->UseRealTime();
-BENCHMARK_CAPTURE(SpawnFromALargeParent, GSpawn, CaptureByGSpawn)->UseRealTime();
-BENCHMARK_CAPTURE(SpawnFromALargeParent, BoostProcess, CaptureByBoost)->UseRealTime();
-BENCHMARK_CAPTURE(SpawnFromALargeParent, Popen, CaptureByPopen)->UseRealTime();
+BENCHMARK_CAPTURE(SpawnFromALargeParent, Zep, CaptureByZep)->Name("SpawnFromALargeParent_Zep")->UseRealTime()->Iterations(20);
+BENCHMARK_CAPTURE(SpawnFromALargeParent, GSpawn, CaptureByGSpawn)
+    ->Name("SpawnFromALargeParent_GSpawn")
+    ->UseRealTime()
+    ->Iterations(20);
+BENCHMARK_CAPTURE(SpawnFromALargeParent, BoostProcess, CaptureByBoost)
+    ->Name("SpawnFromALargeParent_BoostProcess")
+    ->UseRealTime()
+    ->Iterations(20);
+BENCHMARK_CAPTURE(SpawnFromALargeParent, Popen, CaptureByPopen)
+    ->Name("SpawnFromALargeParent_Popen")
+    ->UseRealTime()
+    ->Iterations(20);
 
 }  // namespace

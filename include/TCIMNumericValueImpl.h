@@ -45,6 +45,12 @@ public:
   bool operator==(TCIMValue const& other) const override;
   bool operator<(TCIMValue const& other) const override;
 
+private:
+  friend class TCIMArrayValueImpl;
+
+  // ToString without the string: writes the text at `place`, where there is room for 32 bytes, and returns its end.
+  char* PutText(char* place, unsigned char radix) const;
+
 protected:
   TCIMValue::TCIMType fType;  // kCIMTypeBoolean to kCIMTypeReal64
   union {                     // the member of that type

@@ -10,7 +10,9 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdlib>
+#include <string_view>
 
 namespace NQRVZEP20 {
 namespace {
@@ -152,8 +154,19 @@ int WaitForOutput(int readEnd, int timeoutSeconds) {
   return ::select(FD_SETSIZE, &readable, nullptr, nullptr, timeoutSeconds == -1 ? nullptr : &limit);
 }
 
+constexpr std::size_t kChunkSize = 4095;
+
+// Appends each chunk up to its first zero byte; the rest of a chunk behind one is lost. Kept.
+void AppendChunks(std::string_view text, std::string& output) {
+  for (; !text.empty(); text.remove_prefix(std::min(kChunkSize, text.size()))) {
+    std::string_view const chunk = text.substr(0, kChunkSize);
+    output.append(chunk.substr(0, chunk.find('\0')));
+  }
+}
+
 // Reads to the end of the output; false, with the reason in the log, when that was not reached.
 bool CollectOutput(int readEnd, std::string const& path, int timeoutSeconds, std::string& output) {
+  char buffer[16 * kChunkSize];  // as much as a pipe holds
   for (;;) {
     int const ready = WaitForOutput(readEnd, timeoutSeconds);
     if (ready == 0) {
@@ -164,10 +177,10 @@ bool CollectOutput(int readEnd, std::string const& path, int timeoutSeconds, std
       LogDebug("ERROR: SpawnProcess - select call failed!");
       return false;
     }
-    // The chunk ends at its first zero byte, so the rest behind one is lost, and a failed read appends nothing. Kept.
-    char chunk[4096] = {};
-    if (::read(readEnd, chunk, sizeof chunk - 1) == 0) return true;
-    output.append(chunk);
+    ssize_t const got = ::read(readEnd, buffer, sizeof buffer);
+    if (got == 0) return true;
+    // A failed read appends nothing and the loop goes on. Kept.
+    if (got > 0) AppendChunks({buffer, static_cast<std::size_t>(got)}, output);
   }
 }
 

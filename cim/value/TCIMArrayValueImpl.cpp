@@ -1,8 +1,19 @@
 #include "TCIMArrayValueImpl.h"
 
+#include "TCIMNumericValueImpl.h"
 #include "TZEPException.h"
 
+#include <string_view>
+
 namespace NQRVZEP20 {
+namespace {
+
+bool IsNumber(TCIMValue const& value) {
+  TCIMValue::TCIMType const type = value.GetType();
+  return type >= TCIMValue::TCIMType::kCIMTypeBoolean && type <= TCIMValue::TCIMType::kCIMTypeReal64;
+}
+
+}  // namespace
 
 TCIMArrayValueImpl::TCIMArrayValueImpl(std::vector<TCIMValue> const& elements) : fElements(elements) {}
 TCIMArrayValueImpl::TCIMArrayValueImpl(TCIMArrayValueImpl const& other) = default;
@@ -10,15 +21,28 @@ TCIMArrayValueImpl::~TCIMArrayValueImpl() = default;
 
 TCIMArrayValueImpl::operator std::vector<TCIMValue>&() const { return fElements; }
 
+// The elements are written to where they stay: numbers, which most arrays hold, without a string of their own.
 std::string TCIMArrayValueImpl::ToString(unsigned char radix) const {
+  constexpr std::size_t kRoomForNumber = 32;
   std::string text = "{ ";
-  char const* separator = "";
+  std::size_t length = text.size();
+  auto const makeRoom = [&](std::size_t room) {
+    if (text.size() - length < room) text.resize(2 * (length + room));
+    return text.data() + length;
+  };
+  auto const put = [&](std::string_view piece) { length += piece.copy(makeRoom(piece.size()), piece.size()); };
+
   for (TCIMValue const& element : fElements) {
-    text += separator;
-    text += element.ToString(radix);
-    separator = ", ";
+    if (length > 2) put(", ");
+    if (IsNumber(element)) {
+      char* const place = makeRoom(kRoomForNumber);
+      length += static_cast<std::size_t>(DataOf<TCIMNumericValueImpl>(element).PutText(place, radix) - place);
+    } else {
+      put(element.ToString(radix));
+    }
   }
-  text += " }";
+  put(" }");
+  text.resize(length);
   return text;
 }
 

@@ -1,8 +1,10 @@
 #include "TCIMNumericValueImpl.h"
 
+#include "cim/value/IntegerText.h"
+#include "cim/value/RealText.h"
 #include "cim/value/ScalarTypes.h"
 
-#include <charconv>
+#include <string_view>
 #include <type_traits>
 
 namespace NQRVZEP20 {
@@ -11,37 +13,59 @@ using TType = TCIMValue::TCIMType;
 
 namespace {
 
-// What std::to_chars writes into a buffer, as a string.
-template <class... TArguments>
-std::string ToChars(TArguments... arguments) {
-  char buffer[24];  // a uint64 in base 8 has 22 digits
-  char* const end = std::to_chars(buffer, buffer + sizeof buffer, arguments...).ptr;
-  return std::string(buffer, end);
-}
-
-std::string HexText(unsigned long number, std::size_t width) {
-  std::string text(width, '0');
-  for (auto digit = text.rbegin(); digit != text.rend(); ++digit, number >>= 4) *digit = "0123456789ABCDEF"[number & 0xF];
-  return text;
+void RequireRadix(unsigned char radix) {
+  if (radix != 10 && radix != 16 && radix != 8) throw TZEPException(kZEPStatusNotSupported);
 }
 
 void RequireDecimal(unsigned char radix) {
   if (radix != 10) throw TZEPException(kZEPStatusNotSupported);
 }
 
+// Writes a number at `place` and returns the end of its text. Room as IntegerText.h says.
 template <class TNumber>
-std::string TextOf(TNumber number, unsigned char radix) {
+char* PutNumber(char* place, TNumber number, unsigned char radix) {
   if constexpr (std::is_same_v<TNumber, bool>) {
-    return number ? "true" : "false";
+    std::string_view const text = number ? "true" : "false";
+    return place + text.copy(place, text.size());
   } else if constexpr (std::is_floating_point_v<TNumber>) {
     RequireDecimal(radix);
-    return ToChars(static_cast<double>(number), std::chars_format::general, 6);
+    return PutReal(place, number);
   } else if constexpr (std::is_signed_v<TNumber>) {
     RequireDecimal(radix);
-    return ToChars(number);
+    return PutDecimal(place, static_cast<long>(number));
   } else {
-    return radix == 16 ? HexText(number, 2 * sizeof number) : ToChars(number, radix);
+    if (radix == 10) return PutDecimal(place, static_cast<unsigned long>(number));
+    return radix == 16 ? PutHex(place, number) : PutOctal(place, number);
   }
+}
+
+template <class TNumber>
+std::string LongTextOf(TNumber number, unsigned char radix) {
+  char text[kRoomForInteger];
+  return std::string(text, PutNumber(text, number, radix));
+}
+
+// Writes straight into a string that was made without allocation.
+template <class TNumber>
+std::string ShortTextOf(TNumber number, unsigned char radix) {
+  std::string text("               ", kRoomForShort);
+  text.erase(static_cast<std::size_t>(PutNumber(text.data(), number, radix) - text.data()));
+  return text;
+}
+
+template <class TUnsigned>
+std::string HexText(TUnsigned number) {
+  std::string text("0000000000000000", 2 * sizeof number);
+  PutHex(text.data(), number);
+  return text;
+}
+
+template <class TNumber>
+std::string TextOf(TNumber number, unsigned char radix) {
+  constexpr bool kIsInteger = std::is_integral_v<TNumber> && !std::is_same_v<TNumber, bool>;
+  if constexpr (kIsInteger && std::is_unsigned_v<TNumber>)
+    if (radix == 16) return HexText(number);
+  return kIsInteger && sizeof number == 8 ? LongTextOf(number, radix) : ShortTextOf(number, radix);
 }
 
 // The stored number, read without a virtual call.
@@ -122,20 +146,25 @@ TCIMNumericValueImpl::operator double() const {
 }
 
 std::string TCIMNumericValueImpl::ToString(unsigned char radix) const {
-  if (radix != 10 && radix != 16 && radix != 8) throw TZEPException(kZEPStatusNotSupported);
+  RequireRadix(radix);
   return OnNumber<std::string>(fType, *this, [&](auto number) { return TextOf(number, radix); });
+}
+
+char* TCIMNumericValueImpl::PutText(char* place, unsigned char radix) const {
+  RequireRadix(radix);
+  return OnNumber<char*>(fType, *this, [&](auto number) { return PutNumber(place, number, radix); });
 }
 
 bool TCIMNumericValueImpl::operator==(TCIMValue const& other) const {
   if (other.GetType() != fType) return false;
-  auto const& theirs = DataOf<TCIMNumericValueImpl>(other);
-  return OnNumber<bool>(fType, *this, [&](auto mine) { return mine == Stored<decltype(mine)>(theirs); });
+  return OnNumber<bool>(fType, *this,
+                        [&](auto mine) { return mine == Stored<decltype(mine)>(DataOf<TCIMNumericValueImpl>(other)); });
 }
 
 bool TCIMNumericValueImpl::operator<(TCIMValue const& other) const {
   if (other.GetType() != fType) return false;
-  auto const& theirs = DataOf<TCIMNumericValueImpl>(other);
-  return OnNumber<bool>(fType, *this, [&](auto mine) { return Stored<decltype(mine)>(theirs) > mine; });
+  return OnNumber<bool>(fType, *this,
+                        [&](auto mine) { return Stored<decltype(mine)>(DataOf<TCIMNumericValueImpl>(other)) > mine; });
 }
 
 }  // namespace NQRVZEP20

@@ -145,7 +145,9 @@ TCIMValue::TCIMValue(TCIMType type, std::string& text, boost::shared_ptr<ICIMNam
 }
 
 TCIMValue::TCIMValue(TCIMValue const& other)
-    : fType(other.fType), fData(TData::CopyOf(other.fType, other.fData)), fMaxArraySize(other.IsArray() ? other.fMaxArraySize : 0) {
+    : fType(other.fType),
+      fData(TData::CopyOf(other.fType, other.fData)),
+      fMaxArraySize(other.IsArray() ? other.fMaxArraySize : 0) {
   if (IsReference()) fReferencedClass = other.fReferencedClass;
 }
 

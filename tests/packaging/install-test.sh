@@ -27,7 +27,7 @@ check() {  # check NAME PROGRAM
   [[ $printed == "$expected" ]] || { printf '%s printed:\n%s\ninstead of:\n%s\n' "$1" "$printed" "$expected" >&2; exit 1; }
 }
 
-cmake -S "$here/consumer" -B "$work/cmake" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/cmake.log"
+cmake -G Ninja -S "$here/consumer" -B "$work/cmake" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/cmake.log"
 cmake --build "$work/cmake" >>"$work/cmake.log" || { cat "$work/cmake.log" >&2; exit 1; }
 check "the consumer built with CMake" "$work/cmake/consumer"
 

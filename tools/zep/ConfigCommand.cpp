@@ -118,7 +118,7 @@ std::string AsJson(TSettings const& settings) {
   document["ignored"] = TJson::array();
   for (TIgnoredLine const& line : settings.fIgnored)
     document["ignored"].push_back({{"line", line.fLine}, {"text", line.fText}, {"reason", line.fReason}});
-  return AsText(document);
+  return zep::AsText(document);
 }
 
 // Why there is no setting at all, or none of that key.

@@ -30,6 +30,10 @@ int RunCommandLine(std::vector<std::string> commandLine, int timeout) {
     std::cerr << "zep: there is no command to run\n";
     return kExitUsage;
   }
+  if (commandLine.front().rfind('-', 0) == 0) {
+    std::cerr << "zep: there is no option " << Printable(commandLine.front()) << "\n";
+    return kExitUsage;
+  }
   std::string const program = commandLine.front();
   commandLine.erase(commandLine.begin());
   std::string output;

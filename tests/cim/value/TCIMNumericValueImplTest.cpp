@@ -4,6 +4,7 @@
 
 #include <cmath>
 #include <cstring>
+#include <iomanip>
 #include <limits>
 #include <locale>
 #include <random>
@@ -178,11 +179,42 @@ TYPED_TEST(TCIMNumericConversionTest, EveryOtherRadixIsRefused) {
   }
 }
 
-std::string StreamText(double number) {
+template <class TNumber>
+std::string StreamText(TNumber number, int radix = 10) {
   std::ostringstream stream;
   stream.imbue(std::locale::classic());
-  stream << number;
+  stream << std::setbase(radix) << (radix == 16 ? std::uppercase : std::nouppercase) << std::setfill('0') << std::setw(radix == 16 ? 2 * sizeof number : 0)
+         << +number;
   return stream.str();
+}
+
+template <class TNumber>
+void ExpectStreamText(TNumber number) {
+  for (int const radix : {10, 16, 8}) {
+    if (radix != 10 && std::is_signed_v<TNumber>) continue;
+    ASSERT_EQ(TImpl(number).ToString(static_cast<unsigned char>(radix)), StreamText(number, radix)) << radix;
+    TCIMValue const array(TCIMValue(number).GetType(), 0, {TCIMValue(number)});
+    ASSERT_EQ(array.ToString(static_cast<unsigned char>(radix)), "{ " + StreamText(number, radix) + " }") << radix;
+  }
+}
+
+void ExpectStreamTextOfEachType(unsigned long bits) {
+  ExpectStreamText(static_cast<unsigned char>(bits));
+  ExpectStreamText(static_cast<signed char>(bits));
+  ExpectStreamText(static_cast<unsigned short>(bits));
+  ExpectStreamText(static_cast<short>(bits));
+  ExpectStreamText(static_cast<unsigned int>(bits));
+  ExpectStreamText(static_cast<int>(bits));
+  ExpectStreamText(bits);
+  ExpectStreamText(static_cast<long>(bits));
+}
+
+TEST(TCIMNumericValueImplTest, IntegersPrintAsAStreamPrintsThem) {
+  for (unsigned long power = 1, i = 0; i < 20; ++i, power *= 10)  // where the number of digits changes
+    for (unsigned long const near : {power - 1, power, power + 1, 0 - power, 9 * power}) ExpectStreamTextOfEachType(near);
+
+  std::mt19937_64 random(20070315);
+  for (int i = 0; i < 20000; ++i) ExpectStreamTextOfEachType(random() >> random() % 64);
 }
 
 TEST(TCIMNumericValueImplTest, RealsPrintAsAStreamPrintsThem) {

@@ -64,7 +64,9 @@ TEST_F(RunTest, WithoutACommandOrWithAnOddTimeoutItIsWrongUsage) {
   EXPECT_EQ(run.status, 64);
   EXPECT_EQ(run.errors, "zep: there is no command to run\n");
   for (char const* timeout : {"-2", "x", "99999999999"}) EXPECT_EQ(Run({"--timeout", timeout, "true"}).status, 64) << timeout;
-  EXPECT_EQ(Run({"--unknown", "true"}).status, 64);
+  TRun const unknown = Run({"--unknown", "true"});
+  EXPECT_EQ(unknown.status, 64);
+  EXPECT_EQ(unknown.errors, "zep: there is no option --unknown\n");
 }
 
 }  // namespace
