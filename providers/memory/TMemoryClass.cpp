@@ -160,19 +160,24 @@ std::vector<boost::shared_ptr<TMemoryClass>> TMemoryClass::AllSubClasses() const
   return all;
 }
 
-// What the superclass has, with this class's own declarations put in or added.
+// Made from the top class down, because each builds on that of its superclass.
 boost::shared_ptr<TMemoryLayout const> TMemoryClass::Layout() {
-  if (fLayout) return fLayout;
+  std::vector<boost::shared_ptr<TMemoryClass>> without;
+  for (boost::shared_ptr<TMemoryClass> cls = Self(); cls && !cls->fLayout; cls = cls->SuperClass()) without.push_back(cls);
+  for (auto cls = without.rbegin(); cls != without.rend(); ++cls) (*cls)->MakeLayout();
+  return fLayout;
+}
 
+// What the superclass has, with this class's own declarations put in or added.
+void TMemoryClass::MakeLayout() {
   const auto layout = boost::make_shared<TMemoryLayout>();
-  if (const boost::shared_ptr<TMemoryClass> superClass = SuperClass()) layout->fDecls = superClass->Layout()->fDecls;
+  if (const boost::shared_ptr<TMemoryClass> superClass = SuperClass()) layout->fDecls = superClass->fLayout->fDecls;
   for (auto const& decl : fPropertyDecls.Elements()) layout->fDecls.Put(decl->GetName(TCIMContext()), decl);
 
   auto const& decls = layout->fDecls.Elements();
   for (std::size_t i = 0; i < decls.size(); ++i)
     if (decls[i]->IsKey(TCIMContext())) layout->fKeys.push_back(i);
   fLayout = layout;
-  return fLayout;
 }
 
 }  // namespace NQRVZEP20

@@ -76,7 +76,8 @@ public:
 
 private:
   boost::shared_ptr<TMemoryClass> Self() { return boost::static_pointer_cast<TMemoryClass>(shared_from_this()); }
-  boost::shared_ptr<TMemoryLayout const> Layout();                     // made at the first call
+  boost::shared_ptr<TMemoryLayout const> Layout();  // made at the first call, for the superclasses too
+  void MakeLayout();
   std::vector<boost::shared_ptr<TMemoryClass>> AllSubClasses() const;  // in the order of EnumerateSubClasses
 
   bool const fIsRoot;

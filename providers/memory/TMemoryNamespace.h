@@ -47,8 +47,8 @@ public:
 
   // A path names an instance by its own class and exactly its keys (those that are not NULL): a path with the name of the
   // superclass finds only instances of the superclass itself. Class and key names are compared without regard to case, key
-  // values by their text. An instance without any key value has no path of its own and is never found; nothing keeps a
-  // class from having several such instances.
+  // values by their text, which for reals has every digit. An instance without any key value has no path of its own and is never
+  // found; nothing keeps a class from having several such instances.
   boost::shared_ptr<ICIMInstance> GetInstance(TCIMReference const& path, TCIMContext const& context) const override;
 
   // ---- Filling. Whatever is refused is named in the log, as an error, before the exception passes on. ----

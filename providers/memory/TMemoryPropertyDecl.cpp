@@ -18,10 +18,11 @@ TCIMValue::TCIMType TMemoryPropertyDecl::GetType(TCIMContext const&) const { ret
 
 TCIMValue TMemoryPropertyDecl::GetDefaultValue(TCIMContext const&) const { return fDefaultValue; }
 
-bool TMemoryPropertyDecl::IsKey(TCIMContext const& context) const {
+bool TMemoryPropertyDecl::IsKey(TCIMContext const&) const {
   if (IsMarked(kKey)) return true;
-  const boost::shared_ptr<TMemoryPropertyDecl const> overridden = OverriddenDecl();
-  return overridden && overridden->IsKey(context);
+  for (auto overridden = OverriddenDecl(); overridden; overridden = overridden->OverriddenDecl())
+    if (overridden->IsMarked(kKey)) return true;
+  return false;
 }
 
 boost::weak_ptr<ICIMNamedElement> TMemoryPropertyDecl::GetOwner(TCIMContext const&) const { return fOwner; }

@@ -125,11 +125,16 @@ TEST(TMemoryNamespaceTest, SubclassesComeDepthFirstAndSiblingsInTheOrderOfCreati
   EXPECT_EQ(VisitsUntilSecond(*root, &ICIMClass::EnumerateSubClasses), 2);
 }
 
-TEST(TMemoryNamespaceTest, VeryDeepTreeIsVisitedAndFreed) {
+TEST(TMemoryNamespaceTest, VeryDeepTreeIsUsedAndFreed) {
   auto const ns = NewNamespace();
-  boost::shared_ptr<ICIMClass> last;
-  for (int i = 0; i < 20000; ++i) last = ns->CreateClass(last, "C" + std::to_string(i), kNone);
+  ns->DefineClass("C0").Association().Key("Id", "uint32");
+  boost::shared_ptr<ICIMClass> last = ns->GetClass("C0", kNone);
+  for (int i = 1; i < 20000; ++i) last = ns->CreateClass(last, "C" + std::to_string(i), kNone);
+  auto const id = last->AddPropertyDecl("Id", NullOf("uint32"), kNone);
   EXPECT_EQ(SubClassNames(*ns->GetClass("C0", kNone)).size(), 19999u);
+  EXPECT_TRUE(last->GetClassFlag(kNone));
+  EXPECT_TRUE(id->IsKey(kNone));
+  EXPECT_THAT(Names(*last->CreateInstance(kNone), &ICIMInstance::EnumerateProperties), ElementsAre("Id"));
 }
 
 // ---- Qualifier declarations ----
@@ -272,6 +277,7 @@ TEST_F(TMemoryNamespacePathTest, KeysOfEachKindAreFoundByValue) {
       {"boolean", TCIMValue(true), TCIMValue(false)},
       {"uint8", TCIMValue(static_cast<unsigned char>(65)), TCIMValue(static_cast<unsigned char>(66))},
       {"sint64", TCIMValue(-1L), TCIMValue(1L)},
+      {"real32", TCIMValue(1.0000001f), TCIMValue(1.0000002f)},  // which print the same
       {"real64", TCIMValue(0.5), TCIMValue(0.25)},
       {"char16", TCIMValue(TCIMChar16(65)), TCIMValue(TCIMChar16(66))},
       {"string", TCIMValue("a"), TCIMValue("A")},
