@@ -2,8 +2,10 @@
 
 #include "ILogger.h"
 #include "TCIMDateTime.h"
+#include "TZEPStatusCode.h"
 #include "ZEPExport.h"
 
+#include <cstdio>
 #include <fstream>
 #include <string>
 #include <vector>
@@ -20,6 +22,18 @@ ZEP_EXPORT extern std::string const kNSPExtension;
 // itself asks for neither. Set them once, at start-up.
 ZEP_EXPORT extern bool isLuz;
 ZEP_EXPORT extern bool isParser;  // whether the process runs as the collector's parser
+
+// Where a download goes.
+struct TCurlWriteContext {
+  std::string fPath;   // appended to; empty: nowhere
+  std::FILE* fStream;  // open only while a chunk is written
+};
+
+// libcurl's write callback for downloads: appends `count` items of `size` bytes to the file of the TCurlWriteContext, which
+// it opens for each chunk and closes again, and returns the number of items written; 0 when only closing it shows that the
+// chunk did not get to the disk. 0xFFFFFFFF when there is no context, no path, or the file cannot be opened. Any number but
+// `count` stops libcurl; what was written stays.
+ZEP_EXPORT unsigned long curl_fwrite(void* data, unsigned long size, unsigned long count, void* context);
 
 // Every service of the operating system that the library uses. Static operations only. Each runs on the caller's thread
 // and blocks it until done; none takes a lock. Failures are thrown as TZEPException unless an operation says otherwise.
@@ -267,6 +281,49 @@ public:
   // it and was cleared by the caller: for number 1 without, for later ones with its zero byte. 1 when found, 0 otherwise.
   // The empty string that closes the set is none of its strings. Reads no byte behind `length`.
   static int getBIDString(char* stringSet, char* output, int length, int number);
+
+  // ---- File transfer (TOSSpecificTransfer.cpp) ----
+  //
+  // By libcurl, which each call loads afresh and unloads again: the file libcurl.so or libcurl.so.4 beside the core library,
+  // else by the loader's search libcurl.so, .4, .3 or .2. No call while another one runs: libcurl's global state is one.
+  //
+  // URLs are used as they are: blanks and the like are to be written as "%20". A user and a password stand in the URL.
+  // FTP uses plain passive mode (PASV); no proxy is used, none from the environment either. There is no time-out: a server
+  // that stops in the middle keeps the caller waiting.
+
+  // Uploads the file to the URL, making missing directories there, or downloads the URL into the file.
+  //
+  // When a download finds the local file, it asks on standard output whether to overwrite it, until standard input says "y"
+  // or "n" in either case. For "n" (and at the end of the input), and for "y" when the file cannot be deleted, it returns
+  // without a transfer and without an error. An empty download leaves no file. What arrived of a broken one stays.
+  //
+  // Every failure is logged as an error. Throws kZEPStatusLibCurlFailure when libcurl cannot be had or set up, or the file to
+  // be uploaded cannot be read; kZEPStatusConnectionFailed when the host is unknown or nobody answers there;
+  // kZEPStatusAccessDenied for any other failure of the transfer, a full local disk included.
+  static void CurlTransferFile(std::string url, std::string localFile, bool download);
+
+  // Uploads to ftp://host/name or sftp://host/name; when the environment variable ZEP_ISBOOTABLE is "yes", below
+  // "hostline/toqrv/vantor/fdr_upload/" there.
+  static void FTPFile(std::string host, std::string localFile, std::string remoteName);
+  static void sFTPFile(std::string host, std::string localFile, std::string remoteName);
+
+  // Downloads ftp://host/name or sftp://host/name.
+  static void FTPFileFromQRV(std::string host, std::string localFile, std::string remoteName);
+  static void sFTPFileFromQRV(std::string host, std::string localFile, std::string remoteName);
+
+  // Uploads to ftp://host/name.xml.gz, after saying "Remote file name = name.xml.gz" on standard output.
+  static void UserFTPFile(std::string host, std::string localFile, std::string name);
+
+  // Fetches a web page, chosen when the library is built, through the proxy and appends it to ./content.html.
+  // `userAndPassword` is "user:password"; the last argument is not used. Returns kZEPStatusOK when something came back, which
+  // may be the proxy's own refusal: look at the file. A failing fetch is logged as an error and returns
+  // kZEPStatusConnectionFailed when the proxy is unknown or nobody answers there, else kZEPStatusAccessDenied. Throws
+  // kZEPStatusLibCurlFailure, with an error in the log, when libcurl cannot be had or set up.
+  static TZEPStatusCode CheckProxySetting(std::string proxy, std::string port, std::string userAndPassword, long unused);
+
+  // 0 when the system knows an address of the host, 1 when not, whatever the name says; with a line in the log at debug
+  // severity. The second argument is not used.
+  static int DetectHostnameAvailable(std::string hostName, std::string unused);
 
   // ---- Log (TOSSpecificLog.cpp) ----
 

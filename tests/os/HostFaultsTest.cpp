@@ -117,6 +117,7 @@ std::vector<TOperation> Operations() {
   std::string const openFailed = "[Error] TOSSpecific::OpenOutputFileStream --  Failed to open output file: new";
   std::string const parsing = "[Debug] TConfig::parseConfigFile(): start to parse config file";
   std::string const missing = "[Error] TConfig::parseConfigFile(): config file doesn't exist";
+  std::string const noTransfer = "threw kZEPStatusLibCurlFailure";
   std::string const mapIsEmpty = "[Error] TConfig::getValue(): map is empty";
 
   return {
@@ -247,6 +248,23 @@ std::vector<TOperation> Operations() {
        {{"tcgetattr", "1", EIO, {"107"}}, {"tcsetattr", "all", EIO, {"107"}}, {"read", "1", EINTR, {"-1"}}}},
       {"USleep", {"0"}, {{"usleep", "1", EINTR, {"-1"}}}},
       {"LaunchCommandShell", {"0"}, {{"system", "1", EAGAIN, {"-1"}}}},
+      {"Upload",
+       {"transferred, 0123456789"},
+       {{"open", "1", EACCES, {noTransfer, "[Error] TOSSpecific|CurlTransferFile: Error getting file size"}},
+        {"fstat", "1", EIO, {noTransfer, "[Error] TOSSpecific|CurlTransferFile: Error getting file size"}},
+        {"close", "all", EIO, {"transferred, 0123456789"}},
+        {"fopen", "1", EMFILE, {noTransfer, "[Error] TOSSpecific|CurlTransferFile: Error creating file stream"}}}},
+      {"Download",
+       {"transferred, first second"},
+       {{"fopen", "1", EACCES, {"transferred, first second"}},  // whether the file is there
+        {"fopen",
+         "2",
+         EACCES,
+         {"threw kZEPStatusAccessDenied", "[Error] TOSSpecific|CurlTransferFile: Error performing command: "}},
+        {"fopen",
+         "3",
+         EMFILE,
+         {"threw kZEPStatusAccessDenied, first ", "[Error] TOSSpecific|CurlTransferFile: Error performing command: "}}}},
       {"TConfig",
        {"a,b", parsing},
        {{"stat", "all", EACCES, {"", parsing, missing, mapIsEmpty}},
