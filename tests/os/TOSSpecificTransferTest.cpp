@@ -194,7 +194,7 @@ TEST_F(TransferTest, WhatPerformGivesBecomesAStatus) {
        "[Error] TOSSpecific|CurlTransferFile: Error performing command: server response timeout"},
       {67, "Access denied: 530", kZEPStatusAccessDenied,
        "[Error] TOSSpecific|CurlTransferFile: Error performing command: Access denied: 530"},
-      {-1, "", kZEPStatusAccessDenied, "[Error] TOSSpecific|CurlTransferFile: Error performing command: "},
+      {99, "", kZEPStatusAccessDenied, "[Error] TOSSpecific|CurlTransferFile: Error performing command: "},
   };
   WriteFile(dir_.Path("there"), "text");
   for (TRow const& row : rows)

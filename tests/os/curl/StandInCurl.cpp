@@ -1,8 +1,9 @@
 // A stand-in for libcurl: its six functions, which write down how they are called into the record of the test. Without a record
-// it prints the name of its own file. A build that gives one of the functions another name leaves it out.
+// it prints the name of its own file.
 
 #include "tests/os/curl/StandInCurl.h"
 
+#include <curl/curl.h>
 #include <dlfcn.h>
 #include <sys/stat.h>
 
@@ -89,22 +90,23 @@ void StandInCallsWhatNobodyHas() { ZepFunctionThatNobodyHas(); }
 
 void StandInUse(NQRVZEP20::TCurlRecord* record) { gRecord = record; }
 
-int curl_global_init(long flags) {
+CURLcode curl_global_init(long flags) {
   if (gRecord == nullptr) {
     Dl_info info{};
     ::dladdr(reinterpret_cast<void*>(&StandInUse), &info);
     std::printf("%s\n", info.dli_fname);
   }
   Note("global_init " + std::to_string(flags));
-  return 0;
+  return CURLE_OK;
 }
 
-void* curl_easy_init() {
+CURL* curl_easy_init() {
   Note("easy_init");
   return gRecord != nullptr && gRecord->givesNoHandle ? nullptr : &gHandle;
 }
 
-int curl_easy_setopt(void* handle, int option, ...) {
+// In brackets, because it is a macro as well.
+CURLcode(curl_easy_setopt)(CURL* handle, CURLoption option, ...) {
   std::va_list arguments;
   va_start(arguments, option);
   auto const name = kNames.find(option);
@@ -114,20 +116,20 @@ int curl_easy_setopt(void* handle, int option, ...) {
     Note(std::string("setopt ") + name->second + " " + TextOf(option, arguments));
   }
   va_end(arguments);
-  return gRecord != nullptr && gRecord->refusedOption == option ? 48 : 0;
+  return gRecord != nullptr && gRecord->refusedOption == option ? CURLE_UNKNOWN_OPTION : CURLE_OK;
 }
 
-int curl_easy_perform(void* handle) {
+CURLcode curl_easy_perform(CURL* handle) {
   Note(handle == &gHandle ? "perform" : "perform of a strange handle");
-  if (gRecord == nullptr) return 0;
+  if (gRecord == nullptr) return CURLE_OK;
   gRecord->errorTextAtStart = gErrorBuffer;
   if (gUpload != nullptr) ReadUpload();
-  if (gWrite != nullptr && !WriteChunks()) return 23;
+  if (gWrite != nullptr && !WriteChunks()) return CURLE_WRITE_ERROR;
   if (!gRecord->errorText.empty()) std::strcpy(gErrorBuffer, gRecord->errorText.c_str());
-  return gRecord->result;
+  return static_cast<CURLcode>(gRecord->result);
 }
 
-void curl_easy_cleanup(void* handle) { Note(handle == &gHandle ? "easy_cleanup" : "easy_cleanup of a strange handle"); }
+void curl_easy_cleanup(CURL* handle) { Note(handle == &gHandle ? "easy_cleanup" : "easy_cleanup of a strange handle"); }
 
 void curl_global_cleanup() { Note("global_cleanup"); }
 
