@@ -26,6 +26,9 @@ public:
   // opening quote of a reference that is a key's value in an enclosing path: reading then ends on the closing quote, or at
   // the end of the path, where a missing quote is not noticed.
   static void ParsePath(TCIMReferenceImpl& target, std::string const& path, std::size_t& pos);
+  static void ParsePath(TCIMReference& target, std::string const& path, std::size_t& pos) {
+    ParsePath(*target.GetBody(), path, pos);
+  }
 
   std::string GetPath() const;
   void SetPath(std::string const& path);
