@@ -18,9 +18,12 @@ struct TCommand {
   TRun (*fAddArguments)(CLI::App& command);
 };
 
-TRun AddConfigArguments(CLI::App& command);  // ConfigCommand.cpp
-TRun AddReportArguments(CLI::App& command);  // ReportCommand.cpp
-TRun AddRunArguments(CLI::App& command);     // RunCommand.cpp
-TRun AddShowArguments(CLI::App& command);    // ShowCommand.cpp
+TRun AddConfigArguments(CLI::App& command);      // ConfigCommand.cpp
+TRun AddGetArguments(CLI::App& command);         // GetCommand.cpp
+TRun AddProxyCheckArguments(CLI::App& command);  // ProxyCheckCommand.cpp
+TRun AddReportArguments(CLI::App& command);      // ReportCommand.cpp
+TRun AddRunArguments(CLI::App& command);         // RunCommand.cpp
+TRun AddSendArguments(CLI::App& command);        // SendCommand.cpp
+TRun AddShowArguments(CLI::App& command);        // ShowCommand.cpp
 
 }  // namespace NQRVZEP20::zep

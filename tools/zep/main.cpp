@@ -2,6 +2,7 @@
 
 #include "Commands.h"
 #include "ExitStatus.h"
+#include "Failure.h"
 
 #include <CLI/CLI.hpp>
 
@@ -19,6 +20,9 @@ constexpr TCommand kCommands[] = {
     {"show", "Print one object or class of the providers' namespaces", AddShowArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},
     {"run", "Run a command as the library runs one, and print its output", AddRunArguments},
+    {"send", "Send a file to an FTP or SFTP server", AddSendArguments},
+    {"get", "Fetch a file from an FTP or SFTP server", AddGetArguments},
+    {"proxy-check", "Tell whether a web proxy lets requests through", AddProxyCheckArguments},
 };
 
 int Run(int argc, char const* const* argv) {
@@ -46,7 +50,10 @@ int Run(int argc, char const* const* argv) {
 
 }  // namespace NQRVZEP20::zep
 
-int main(int argc, char** argv) try { return NQRVZEP20::zep::Run(argc, argv); } catch (std::exception const& failure) {
+int main(int argc, char** argv) try { return NQRVZEP20::zep::Run(argc, argv); } catch (NQRVZEP20::zep::TWrongUsage const& wrong) {
+  std::cerr << "zep: " << wrong.what() << '\n';
+  return NQRVZEP20::zep::kExitUsage;
+} catch (std::exception const& failure) {
   std::cerr << "zep: " << failure.what() << '\n';
   return NQRVZEP20::zep::kExitNothing;
 }
