@@ -177,6 +177,7 @@ TEST_P(FileServerTest, ACutConnectionIsDeniedAndThePartStays) {
 }
 
 TEST_P(FileServerTest, AFullLocalDiskIsDenied) {
+  NEEDS(MayMount(), "the right to mount");
   // 65,636 bytes fit but for the last 100, which are still buffered when the last chunk was written.
   Put(Url("big"), LocalFile(RandomBytes(3000000)));
   Put(Url("tail"), LocalFile(RandomBytes(65636)));
