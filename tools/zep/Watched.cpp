@@ -108,6 +108,7 @@ TOutcome OutcomeOf(std::string const& report, TWatch const& watch) {
   std::size_t const blank = report.find(' ');
   if (blank == report.npos) return {kZEPStatusFail, kExitNothing, "the process of the transfer died"};
   TZEPStatusCode const status(static_cast<EZEPStatusCode>(std::stoi(report.substr(0, blank))));
+  if (status == kZEPStatusOK) return {status, kExitComplete, ""};
   std::string const reason = Printable(Without(watch.fSecret, report.substr(blank + 1)));
   return {status, ExitStatusOf(status), reason.empty() ? status.TranslateStatusCode() : reason};
 }
