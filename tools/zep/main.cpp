@@ -6,10 +6,12 @@
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
 #include <exception>
 #include <iostream>
 #include <map>
 #include <string>
+#include <vector>
 
 namespace NQRVZEP20::zep {
 
@@ -25,6 +27,20 @@ constexpr TCommand kCommands[] = {
     {"proxy-check", "Tell whether a web proxy lets requests through", AddProxyCheckArguments},
 };
 
+// The arguments, the last one first, as CLI11 takes them. It would hand what stands behind "--" to zep itself: of
+// "zep run [OPTIONS] -- COMMAND" the mark is left out, and the command begins all the same.
+std::vector<std::string> ArgumentsOf(int argc, char const* const* argv) {
+  std::vector<std::string> arguments(argv + 1, argv + argc);
+  if (!arguments.empty() && arguments.front() == "run") {
+    auto word = arguments.begin() + 1;
+    while (word != arguments.end() && word->rfind('-', 0) == 0 && *word != "--")
+      word += *word == "--timeout" && word + 1 != arguments.end() ? 2 : 1;
+    if (word != arguments.end() && *word == "--") arguments.erase(word);
+  }
+  std::reverse(arguments.begin(), arguments.end());
+  return arguments;
+}
+
 int Run(int argc, char const* const* argv) {
   CLI::App app("zep tells what a server knows of itself, through the provider plug-ins beside libzepcore.so.", "zep");
   app.set_version_flag("--version", "zep " ZEP_VERSION " (build " ZEP_BUILD_ID ")");
@@ -38,7 +54,7 @@ int Run(int argc, char const* const* argv) {
   }
 
   try {
-    app.parse(argc, argv);
+    app.parse(ArgumentsOf(argc, argv));
   } catch (CLI::ParseError const& stop) {
     bool const isAnswered = app.exit(stop, std::cout, std::cerr) == 0;  // --help, --version
     return isAnswered ? kExitComplete : kExitUsage;
