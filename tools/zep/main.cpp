@@ -55,6 +55,11 @@ int Run(int argc, char const* const* argv) {
 
   try {
     app.parse(ArgumentsOf(argc, argv));
+  } catch (CLI::ExtrasError const& stop) {
+    bool const maySayPassword = std::string(stop.what()).find('@') != std::string::npos;
+    if (maySayPassword) throw TWrongUsage("there are arguments too many");
+    app.exit(stop, std::cout, std::cerr);
+    return kExitUsage;
   } catch (CLI::ParseError const& stop) {
     bool const isAnswered = app.exit(stop, std::cout, std::cerr) == 0;  // --help, --version
     return isAnswered ? kExitComplete : kExitUsage;
