@@ -139,6 +139,15 @@ EXPORT int close(int fd) {
   return -1;
 }
 
+EXPORT int fclose(FILE* file) {
+  static auto* const next = Next("fclose", &fclose);
+  bool const fails = IsTheOne("fclose");
+  int const result = next(file);
+  if (!fails) return result;
+  errno = gError;
+  return EOF;
+}
+
 EXPORT int closedir(DIR* dir) {
   static auto* const next = Next("closedir", &closedir);
   bool const fails = IsTheOne("closedir");
