@@ -22,5 +22,6 @@ TRun AddConfigArguments(CLI::App& command);  // ConfigCommand.cpp
 TRun AddReportArguments(CLI::App& command);  // ReportCommand.cpp
 TRun AddRunArguments(CLI::App& command);     // RunCommand.cpp
 TRun AddShowArguments(CLI::App& command);    // ShowCommand.cpp
+TRun AddWpadArguments(CLI::App& command);    // WpadCommand.cpp
 
 }  // namespace NQRVZEP20::zep

@@ -19,6 +19,7 @@ constexpr TCommand kCommands[] = {
     {"show", "Print one object or class of the providers' namespaces", AddShowArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},
     {"run", "Run a command as the library runs one, and print its output", AddRunArguments},
+    {"wpad", "Find the proxy configuration file that the DHCP server names", AddWpadArguments},
 };
 
 int Run(int argc, char const* const* argv) {

@@ -1,35 +1,18 @@
 // The discovery of the web proxy beside real DHCP servers, in namespaces of their own (run-in-netns.sh). Where it does not
 // matter how long a wait is, WpadProbe waits a twentieth of it and says so: "(up to 6 s)".
 
-#include "tests/Support.h"
-
-#include <sys/wait.h>
-#include <unistd.h>
+#include "tests/system/wpad/WpadBed.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <cstdlib>
 
 namespace NQRVZEP20 {
 namespace {
 
-using TLines = std::vector<std::string>;
-
 TLines operator+(TLines left, TLines const& right) {
   left.insert(left.end(), right.begin(), right.end());
   return left;
-}
-
-TLines LinesOf(std::string const& text) {
-  TLines lines;
-  std::istringstream stream(text);
-  for (std::string line; std::getline(stream, line);) lines.push_back(line);
-  return lines;
-}
-
-bool IsThere(std::string const& program) {
-  return std::system(("PATH=$PATH:/usr/sbin:/sbin command -v " + program + " > /dev/null").c_str()) == 0;
 }
 
 // What WpadProbe printed.
@@ -53,32 +36,8 @@ TLines const kFoundBy6 = {"[Debug] Get  DHCP wpadurl via IPV6 is =http://wpad.te
 
 TLines Thrice(TLines const& lines) { return lines + lines + lines; }
 
-class WpadTest : public testing::Test {
+class WpadTest : public TWpadBed {
 protected:
-  void SetUp() override {
-    NEEDS(::geteuid() == 0, "only root makes networks");
-    for (auto const& [program, package] : {std::pair{"dhcpd", "isc-dhcp-server"},
-                                           {"ip", "iproute2"},
-                                           {"python3", "python3"},
-                                           {"ps", "procps"},
-                                           {"ifconfig", "net-tools"},
-                                           {"busybox", "busybox"},
-                                           {"dnsmasq", "dnsmasq-base"}})
-      NEEDS(IsThere(program), std::string("no ") + program + " (package " + package + ")");
-  }
-
-  // What the shell command prints within the namespaces; $PROBE is WpadProbe. `settings` are those of run-in-netns.sh and
-  // WpadProbe: "WPAD_SERVER=none ".
-  std::string Inside(std::string const& settings, std::string const& command) {
-    WriteFile(dir_.Path("command"), command);
-    std::string const call = "PATH=$PATH:/usr/sbin:/sbin PROBE=" WPAD_PROBE " " + settings +
-                             " timeout 60 " ZEP_SOURCE_DIR "/tests/system/wpad/run-in-netns.sh bash " + dir_.Path("command") +
-                             " > " + dir_.Path("out") + " 2> " + dir_.Path("err");
-    int const status = std::system(call.c_str());
-    EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0) << status << ": " << ReadFile(dir_.Path("err"));
-    return ReadFile(dir_.Path("out"));
-  }
-
   static TDiscovery DiscoveryIn(std::string const& output) {
     TLines const lines = LinesOf(output);
     TDiscovery discovery;
@@ -97,14 +56,6 @@ protected:
   TDiscovery DiscoverInHurry(std::string const& settings, std::string const& before = "") {
     return Discover("ZEP_WPAD_HURRY=1 " + settings, before);
   }
-
-  // A file for the server "bytes".
-  std::string ReplyFile(std::string const& hexadecimal) {
-    WriteFile(dir_.Path("reply"), hexadecimal);
-    return "WPAD_SERVER=bytes WPAD_REPLY=" + dir_.Path("reply") + " ";
-  }
-
-  TTempDir dir_;
 };
 
 std::string const kRecorded = "WPAD_SERVER=bytes WPAD_REPLY=" ZEP_TEST_DATA_DIR "/wpad/reply-kea.hex ";
@@ -323,7 +274,7 @@ TEST_F(WpadTest, DhcpClientsAreEnded) {
     mkdir /dev/shm/bin; for name in xdhclient6 dhclien; do cp "$(command -v sleep)" /dev/shm/bin/$name; /dev/shm/bin/$name 99 & done
     names() { ps -e -o comm= | grep -E 'dhclien' | sort | xargs; }
     until [ "$(names | wc -w)" = 3 ]; do sleep 0.02; done
-    names; $PROBE stop; names; ls /dev/nul)sh"));
+    names; $PROBE stop; sleep 0.3; names; ls /dev/nul)sh"));
   EXPECT_EQ(lines.size(), 6u);
   EXPECT_EQ(lines[0], "dhclien dhclient xdhclient6");
   EXPECT_EQ(TLines(lines.begin() + 3, lines.end()), (kStops + TLines{"dhclien", "/dev/nul"}));

@@ -123,7 +123,7 @@ for n in null zero full random urandom tty; do : > "$tmp/dev/$n"; mount --bind "
 mkdir "$tmp/dev/pts" "$tmp/dev/shm"
 mount --bind /dev/pts "$tmp/dev/pts" 2>/dev/null || true
 mount -t tmpfs tmpfs "$tmp/dev/shm"
-ln -s /proc/self/fd "$tmp/dev/fd"
+ln -s pts/ptmx "$tmp/dev/ptmx"; ln -s /proc/self/fd "$tmp/dev/fd"
 for n in 0:stdin 1:stdout 2:stderr; do ln -s "/proc/self/fd/${n%:*}" "$tmp/dev/${n#*:}"; done
 mount --move "$tmp/dev" /dev
 for f in hosts resolv.conf; do [ ! -e "/etc/$f" ] || mount --bind "$tmp/$f" "/etc/$f"; done
