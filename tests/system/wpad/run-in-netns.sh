@@ -66,8 +66,8 @@ ip -n "$c" addr add "${WPAD_ADDRESS:-10.77.0.2}/16" broadcast 10.77.255.255 dev 
 ip -n "$c" addr add fd77::2/64 dev "$name" nodad
 for n in "$s" "$c"; do ip -n "$n" link set lo up; done
 ip -n "$s" link set srv0 up; ip -n "$c" link set "$name" up
-for _ in $(seq 100); do   # carrier comes a moment after "up"
-  ip -n "$c" -o link show "$name" | grep -q 'state UP' && break
+for _ in $(seq 100); do   # carrier comes a moment after "up"; other namespaces that come and go are complained of
+  ip -n "$c" -o link show "$name" 2>/dev/null | grep -q 'state UP' && break
   sleep 0.02
 done
 [ "${WPAD_ROUTE:-default}" = none ] || ip -n "$c" route add default via 10.77.0.1
