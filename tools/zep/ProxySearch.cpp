@@ -212,7 +212,7 @@ TSearch SearchProxy(TOnWait const& onWait) {
   TAsking last;
   for (TAsking const& interface : EthernetInterfaces()) {
     if (!Include(interface, search, onWait)) return search;
-    last.fHardwareAddress = interface.fHardwareAddress;
+    if (!interface.fAddress.empty()) last.fHardwareAddress = interface.fHardwareAddress;  // as the library has it
   }
   last.fAddress = ShownIPV6Address();
   if (!last.fAddress.empty()) Include(last, search, onWait);

@@ -43,7 +43,8 @@ std::string WhyNoListening();
 // Whether another program holds the port at this moment.
 bool IsPortTaken();
 
-// The discovery of AutoProxyDiscovery::StartWpad, step by step, but for the ending of DHCP clients.
+// The discovery of AutoProxyDiscovery::StartWpad, step by step, but for the ending of DHCP clients. And a person does not
+// wait where nothing can come: a message that cannot be sent is not waited for, and a port that stays taken ends it all.
 TSearch SearchProxy(TOnWait const& onWait);
 
 }  // namespace NQRVZEP20::zep
