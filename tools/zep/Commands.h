@@ -25,5 +25,6 @@ TRun AddReportArguments(CLI::App& command);      // ReportCommand.cpp
 TRun AddRunArguments(CLI::App& command);         // RunCommand.cpp
 TRun AddSendArguments(CLI::App& command);        // SendCommand.cpp
 TRun AddShowArguments(CLI::App& command);        // ShowCommand.cpp
+TRun AddWpadArguments(CLI::App& command);        // WpadCommand.cpp
 
 }  // namespace NQRVZEP20::zep

@@ -25,6 +25,7 @@ constexpr TCommand kCommands[] = {
     {"send", "Send a file to an FTP or SFTP server", AddSendArguments},
     {"get", "Fetch a file from an FTP or SFTP server", AddGetArguments},
     {"proxy-check", "Tell whether a web proxy lets requests through", AddProxyCheckArguments},
+    {"wpad", "Find the proxy configuration file that the DHCP server names", AddWpadArguments},
 };
 
 // The arguments, the last one first, as CLI11 takes them. It would hand what stands behind "--" to zep itself: of
