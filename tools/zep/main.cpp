@@ -2,6 +2,8 @@
 
 #include "Commands.h"
 #include "ExitStatus.h"
+#include "Text.h"
+#include "UnfitName.h"
 
 #include <CLI/CLI.hpp>
 
@@ -17,6 +19,7 @@ namespace {
 constexpr TCommand kCommands[] = {
     {"report", "Tell which machine this is", AddReportArguments},
     {"show", "Print one object or class of the providers' namespaces", AddShowArguments},
+    {"media", "List, mount and unmount removable media", AddMediaArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},
     {"run", "Run a command as the library runs one, and print its output", AddRunArguments},
 };
@@ -46,7 +49,12 @@ int Run(int argc, char const* const* argv) {
 
 }  // namespace NQRVZEP20::zep
 
-int main(int argc, char** argv) try { return NQRVZEP20::zep::Run(argc, argv); } catch (std::exception const& failure) {
-  std::cerr << "zep: " << failure.what() << '\n';
+int main(int argc, char** argv) try {
+  return NQRVZEP20::zep::Run(argc, argv);
+} catch (NQRVZEP20::zep::TUnfitName const& failure) {
+  std::cerr << "zep: " << NQRVZEP20::zep::Printable(failure.what()) << '\n';
+  return NQRVZEP20::zep::kExitUsage;
+} catch (std::exception const& failure) {
+  std::cerr << "zep: " << NQRVZEP20::zep::Printable(failure.what()) << '\n';
   return NQRVZEP20::zep::kExitNothing;
 }
