@@ -1,6 +1,6 @@
 // Does one operation on removable media and prints what came of it. Run in a virtual machine that has some.
 //
-//   MediaProbe virtual KIND            the controller's virtual devices: whole, then cut
+//   MediaProbe virtual KIND KEEPWHOLE  the controller's virtual devices
 //   MediaProbe enumerate [COMMAND]     what the host provider's namespace leads to; COMMAND is run once it is filled
 //   MediaProbe ids DEVICEID...         the same for a namespace of disks with these identifiers
 //   MediaProbe mount DEVICE
@@ -23,12 +23,10 @@ namespace {
 using namespace NQRVZEP20;
 using TArguments = std::vector<std::string>;
 
-void ListVirtualDevices(int kind) {
-  for (bool const keepWhole : {true, false}) {
-    std::vector<std::string> devices;
-    TOSSpecific::getxBMCVirtualDevices(kind, devices, keepWhole);
-    for (std::string const& device : devices) std::cout << device << "\n";
-  }
+void ListVirtualDevices(int kind, bool keepWhole) {
+  std::vector<std::string> devices;
+  TOSSpecific::getxBMCVirtualDevices(kind, devices, keepWhole);
+  for (std::string const& device : devices) std::cout << device << "\n";
 }
 
 void Enumerate(boost::shared_ptr<ICIMNamespace> ns) {
@@ -59,7 +57,7 @@ boost::shared_ptr<ICIMNamespace> NamespaceOf(TArguments const& ids) {
 }
 
 void Do(std::string const& operation, TArguments const& arguments) {
-  if (operation == "virtual") return ListVirtualDevices(std::stoi(arguments.at(0)));
+  if (operation == "virtual") return ListVirtualDevices(std::stoi(arguments.at(0)), arguments.at(1) == "1");
   if (operation == "ids") return Enumerate(NamespaceOf(arguments));
   if (operation == "mount") return void(std::cout << TOSSpecific::MountDevice(arguments.at(0)) << "\n");
   if (operation == "umount") return TOSSpecific::UnmountDevice(arguments.at(0), arguments.at(1));

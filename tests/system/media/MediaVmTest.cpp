@@ -75,10 +75,10 @@ private:
 // ---- The library ----
 
 TEST_F(MediaVmTest, TheControllersVirtualDevicesAreFound) {
-  EXPECT_EQ(Result("virtual-0"), "/dev/sdc (/dev/sg3)\n/dev/sdc\n");
-  EXPECT_EQ(Result("virtual-1"), "/dev/sr1\n/dev/sr1\n");
-  EXPECT_THAT(Result("virtual-2"), testing::MatchesRegex("(/dev/input/event[0-9]+)\n/dev/input/event[0-9]+\n"));
-  EXPECT_THAT(Result("virtual-3"), testing::MatchesRegex("/dev/input/mice .*\n/dev/input/mice\n"));
+  EXPECT_EQ(Result("virtual-disk"), "/dev/sdc (/dev/sg3)\n");
+  EXPECT_EQ(Result("virtual-cdrom"), "/dev/sr1\n");
+  EXPECT_THAT(Result("virtual-keyboard"), testing::MatchesRegex("/dev/input/event[0-9]+\n"));
+  EXPECT_EQ(Result("virtual-mouse"), "/dev/input/mice\n");
 }
 
 TEST_F(MediaVmTest, UsbDisksAndTheFloppyDriveAreEnumerated) {

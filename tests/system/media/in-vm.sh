@@ -25,7 +25,10 @@ key_mounts() { grep ' /mnt/key ' /proc/mounts | cut -d ' ' -f 1-3; }
 
 # ---- The library ----
 
-for kind in 0 1 2 3; do "$probe" virtual $kind > /out/virtual-$kind; done
+"$probe" virtual 0 1 > /out/virtual-disk
+"$probe" virtual 1 1 > /out/virtual-cdrom
+"$probe" virtual 2 0 > /out/virtual-keyboard
+"$probe" virtual 3 0 > /out/virtual-mouse
 
 "$probe" enumerate > /out/enumerate
 key_mounts >> /out/enumerate
