@@ -232,6 +232,19 @@ TEST_F(ZepMediaTest, AMediumThatTakesNoDataIsAFailure) {
   EXPECT_THAT(text, testing::EndsWith("\nexit status 1\nunmounted"));
 }
 
+// The kernel keeps a loop device that is in use until the last user goes, so that the report arrives all the same.
+TEST_F(ZepMediaTest, ALoopDeviceDetachedInTheMiddleStillGetsTheReport) {
+  MakeImage(dir_.Path("key"), "whole");
+  std::string const text = WithZep([&] {
+    TLoopDevice const loop(dir_.Path("key"));
+    TRun const run = installation_->Run(
+        {{"report", "--sample", "--to-media", loop.Path()},
+         {{"LD_PRELOAD", ZEP_PULLS_OUT}, {"ZEP_PULL", "/usr/sbin/losetup --detach " + loop.Path()}, {"ZEP_PULL_AT", "1"}}});
+    return run.errors + "exit status " + std::to_string(run.status) + " " + Joined(NamesIn(dir_.Path("key")));
+  });
+  EXPECT_THAT(text, StartsWith("exit status 0 label.txt zep-report-sample-server-"));
+}
+
 TEST_F(ZepMediaTest, ADetachedLoopDeviceIsAFailure) {
   MakeImage(dir_.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
