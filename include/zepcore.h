@@ -3,6 +3,7 @@
 // Every public header of the library.
 
 #include "AssertionHandler.h"
+#include "AutoProxyDiscovery.h"
 #include "ICIMClass.h"
 #include "ICIMElement.h"
 #include "ICIMInstance.h"

@@ -207,6 +207,7 @@ std::vector<TOperation> Operations() {
         {"open", "all", EACCES, {fileError + ", not all"}},
         {"copy_file_range", "all", EXDEV, {"copied, all"}},  // whatever the kernel did not copy is read and written
         {"read", "all", EIO, {fileError + ", all"}},
+        {"lseek", "all", EIO, {fileError + ", all"}},
         {"write", "1", ENOSPC, {fileError + ", all"}},  // of the last chunk, which is written once more
         {"close", "all", EIO, {"copied, all"}}}},
       {"DirCopy",

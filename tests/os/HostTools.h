@@ -16,13 +16,6 @@
 
 namespace NQRVZEP20 {
 
-// A sanitizer makes some calls for itself: vfork among them, which that for threads turns into fork.
-#if defined(__has_feature)
-constexpr bool kIsSanitized = __has_feature(address_sanitizer) || __has_feature(thread_sanitizer);
-#else
-constexpr bool kIsSanitized = false;
-#endif
-
 // The path of a program of tests/os/children.
 inline std::string Child(std::string const& name) { return std::string(ZEP_CHILDREN_DIR) + "/" + name; }
 

@@ -23,5 +23,6 @@ TRun AddMediaArguments(CLI::App& command);   // MediaCommand.cpp
 TRun AddReportArguments(CLI::App& command);  // ReportCommand.cpp
 TRun AddRunArguments(CLI::App& command);     // RunCommand.cpp
 TRun AddShowArguments(CLI::App& command);    // ShowCommand.cpp
+TRun AddWpadArguments(CLI::App& command);    // WpadCommand.cpp
 
 }  // namespace NQRVZEP20::zep
