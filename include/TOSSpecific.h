@@ -5,13 +5,16 @@
 #include "TZEPStatusCode.h"
 #include "ZEPExport.h"
 
+#include <boost/shared_ptr.hpp>
 #include <cstdio>
+
 #include <fstream>
 #include <string>
 #include <vector>
 
 namespace NQRVZEP20 {
 
+class ICIMNamespace;
 class INamespaceConsumer;
 class TPluginManagerProvider;  // the host's handle for the machine-identification library; only ever handed on
 
@@ -34,6 +37,13 @@ struct TCurlWriteContext {
 // chunk did not get to the disk. 0xFFFFFFFF when there is no context, no path, or the file cannot be opened. Any number but
 // `count` stops libcurl; what was written stays.
 ZEP_EXPORT unsigned long curl_fwrite(void* data, unsigned long size, unsigned long count, void* context);
+
+// One medium that can be taken out of the machine.
+struct TRemovableMedium {
+  std::string fDevice;       // "/dev/sdb"
+  std::string fDescription;  // for people: "Example Virtual Disk"
+  std::string fMountPoint;   // "/mnt/key"; empty when it could not be mounted
+};
 
 // Every service of the operating system that the library uses. Static operations only. Each runs on the caller's thread
 // and blocks it until done; none takes a lock. Failures are thrown as TZEPException unless an operation says otherwise.
@@ -325,6 +335,39 @@ public:
   // 0 when the system knows an address of the host, 1 when not, whatever the name says; with a line in the log at debug
   // severity. The second argument is not used.
   static int DetectHostnameAvailable(std::string hostName, std::string unused);
+  // ---- Removable media and devices (TOSSpecificMedia.cpp) ----
+  //
+  // Devices are mounted and unmounted by the system's own commands, run through the shell. Names are put into the command
+  // line as they are, without quotes: hand on none that was not checked.
+
+  // Mounts a device, or else its first partition (the name with a "1" behind it), and returns the mount point: "/mnt/floppy"
+  // for exactly "/dev/floppy", "/dev/fd0" and "/dev/fd1", "/mnt/key" for any other. When anything is mounted there already,
+  // that stays and nothing is mounted: the mount point then need not be the device's. Throws kZEPStatusFileSystemError when
+  // neither can be mounted; why, the command keeps to itself. The mount point must exist.
+  static std::string MountDevice(std::string device);
+
+  // Unmounts what is mounted at `mountPoint`; the device is not looked at. Throws kZEPStatusFileSystemError when the command
+  // fails.
+  static void UnmountDevice(std::string device, std::string mountPoint);
+
+  // Appends the device files of the virtual devices that the management controller shows to this host, as the program
+  // "hwinfo" tells them: `kind` is 0 for disks, 1 for CD-ROMs, 2 for keyboards, 3 for mice; for any other nothing is run. An
+  // alias in parentheses behind a name is kept with `keepWhole` ("/dev/sdc (/dev/sg3)"), except for CD-ROMs, and cut off
+  // without. Nothing is appended when hwinfo is missing; 300 seconds of silence are allowed to it.
+  static void getxBMCVirtualDevices(int kind, std::vector<std::string>& devices, bool keepWhole);
+
+  // Finds the USB disks among the instances of the namespace's class QRVSG_SCSIDevice, mounts each as MountDevice does, and
+  // adds the floppy drive, unmounted, when the machine has one. In the order of the instances.
+  //
+  // A disk is an instance whose DeviceType is "Direct Access Device". Its DeviceID is its SCSI address as Linux writes it,
+  // "host:channel:target:lun", or a generic SCSI node, "/dev/sg2", which is asked for it; a node /dev/sda to /dev/sdz of the
+  // same address is its device. It is a USB disk when the kernel's list of USB devices holds the one that sysfs shows above
+  // it. The description is VendorID and ProductID.
+  //
+  // All disks share the one mount point: of several only the first is mounted, the others get the same mount point. Nodes
+  // that cannot be asked, instances without a node and failures to mount are logged at debug severity. What the namespace
+  // throws is passed on: kZEPStatusNotFound when it has no such class.
+  static std::vector<TRemovableMedium> EnumerateRemovableMedia(boost::shared_ptr<ICIMNamespace> ns);
 
   // ---- Log (TOSSpecificLog.cpp) ----
 

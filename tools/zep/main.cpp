@@ -3,6 +3,7 @@
 #include "Commands.h"
 #include "ExitStatus.h"
 #include "Failure.h"
+#include "Text.h"
 
 #include <CLI/CLI.hpp>
 
@@ -20,6 +21,7 @@ namespace {
 constexpr TCommand kCommands[] = {
     {"report", "Tell which machine this is", AddReportArguments},
     {"show", "Print one object or class of the providers' namespaces", AddShowArguments},
+    {"media", "List, mount and unmount removable media", AddMediaArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},
     {"run", "Run a command as the library runs one, and print its output", AddRunArguments},
     {"send", "Send a file to an FTP or SFTP server", AddSendArguments},
@@ -72,10 +74,12 @@ int Run(int argc, char const* const* argv) {
 
 }  // namespace NQRVZEP20::zep
 
-int main(int argc, char** argv) try { return NQRVZEP20::zep::Run(argc, argv); } catch (NQRVZEP20::zep::TWrongUsage const& wrong) {
-  std::cerr << "zep: " << wrong.what() << '\n';
+int main(int argc, char** argv) try {
+  return NQRVZEP20::zep::Run(argc, argv);
+} catch (NQRVZEP20::zep::TWrongUsage const& failure) {
+  std::cerr << "zep: " << NQRVZEP20::zep::Printable(failure.what()) << '\n';
   return NQRVZEP20::zep::kExitUsage;
 } catch (std::exception const& failure) {
-  std::cerr << "zep: " << failure.what() << '\n';
+  std::cerr << "zep: " << NQRVZEP20::zep::Printable(failure.what()) << '\n';
   return NQRVZEP20::zep::kExitNothing;
 }

@@ -74,6 +74,7 @@ private:
     if (!call.directory.empty() && ::chdir(call.directory.c_str()) != 0) ::_exit(126);
     std::signal(SIGPIPE, call.ignoresBrokenPipes ? SIG_IGN : SIG_DFL);
     for (char const* name : {"ZEP_SMBIOS_TABLE", "ZEP_HOST_NAME", "LD_LIBRARY_PATH"}) ::unsetenv(name);
+    ::setenv("ZEP_SCSI_DEVICES", Path("no-scsi-devices").c_str(), 1);  // whatever this machine has
     for (auto const& [name, value] : call.environment) ::setenv(name.c_str(), value.c_str(), 1);
     if (call.asNobody && !BecomeNobody()) ::_exit(126);
 
