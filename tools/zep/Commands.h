@@ -19,6 +19,7 @@ struct TCommand {
 };
 
 TRun AddConfigArguments(CLI::App& command);  // ConfigCommand.cpp
+TRun AddRemoteArguments(CLI::App& command);  // RemoteCommand.cpp
 TRun AddReportArguments(CLI::App& command);  // ReportCommand.cpp
 TRun AddRunArguments(CLI::App& command);     // RunCommand.cpp
 TRun AddShowArguments(CLI::App& command);    // ShowCommand.cpp

@@ -18,6 +18,7 @@ constexpr TCommand kCommands[] = {
     {"report", "Tell which machine this is", AddReportArguments},
     {"show", "Print one object or class of the providers' namespaces", AddShowArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},
+    {"remote", "Tell which machines are behind management controllers", AddRemoteArguments},
     {"run", "Run a command as the library runs one, and print its output", AddRunArguments},
 };
 
