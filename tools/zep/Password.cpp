@@ -36,8 +36,9 @@ public:
     if (fFd < 0 || ::tcgetattr(fFd, &fOld) != 0)
       throw std::runtime_error("there is no terminal to ask for the password: set ZEP_BMC_PASSWORD or use --password-file");
     termios quiet = fOld;
-    // An interrupt arrives as a character, so that it cannot leave the terminal without echo.
+    // An interrupt arrives as a character that ends the line, so that it cannot leave the terminal without echo.
     quiet.c_lflag &= ~static_cast<tcflag_t>(ECHO | ISIG);
+    quiet.c_cc[VEOL] = fOld.c_cc[VINTR];
     ::tcsetattr(fFd, TCSAFLUSH, &quiet);
   }
   ~TQuietTerminal() {

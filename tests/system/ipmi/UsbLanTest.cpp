@@ -77,7 +77,8 @@ TEST_F(UsbLanTest, AnInterfaceGetsAnAddressInTheControllersRange) {
 }
 
 TEST_F(UsbLanTest, OtherAddressesStay) {
-  RunShell("ip link add bmc0 type veth peer name far0 && ip addr add 10.1.2.3/24 dev bmc0 && ip addr add 169.254.95.1/24 dev bmc0");
+  RunShell(
+      "ip link add bmc0 type veth peer name far0 && ip addr add 10.1.2.3/24 dev bmc0 && ip addr add 169.254.95.1/24 dev bmc0");
   ::setenv("ZEP_USBLAN_INTERFACES", "bmc0", 1);
   EXPECT_EQ(query_(0), 0) << "it is down";
   EXPECT_EQ(bringUp_(0), 0) << "the address being there already";
@@ -120,7 +121,7 @@ TEST_F(NodesTest, TheLinkBringsTheInterfaceUpAndConnects) {
   RunShell("ip link add bmc0 type veth peer name controller0");
   std::string const space = "zep-usblan-" + std::to_string(::getpid());
   RunShell("ip netns add " + space + " && ip link set controller0 netns " + space + " && ip -n " + space +
-      " addr add 169.254.95.118/24 dev controller0 && ip -n " + space + " link set controller0 up");
+           " addr add 169.254.95.118/24 dev controller0 && ip -n " + space + " link set controller0 up");
   ::setenv("ZEP_USBLAN_INTERFACES", "bmc0", 1);
   std::promise<void> isReady, ends;
   std::thread controller([&] {  // the simulator ends with the thread that started it
