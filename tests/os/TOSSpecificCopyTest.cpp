@@ -341,13 +341,12 @@ TEST_F(DirCopyTest, WhatCreateDirAndFileCopyThrowPassesThrough) {
 
 TEST_F(DirCopyTest, WhatWasCopiedBeforeAFailureStays) {
   fs::create_directory(fDir.Path("one"));
-  WriteFile(fDir.Path("one/file"), "text");
-  fs::create_directory(fDir.Path("one/dir"));
-  WriteFile(fDir.Path("one/dir/x"), "");
-  fs::create_directories(fDir.Path("to"));
-  WriteFile(fDir.Path("to/dir"), "in the way");
-  EXPECT_STATUS(TOSSpecific::DirCopy(fDir.Path("one"), fDir.Path("to"), true), kZEPStatusDirectoryAlreadyExists);
-  EXPECT_EQ(ReadFile(fDir.Path("to/dir")), "in the way");
+  for (char const* name : {"a", "b", "c"}) WriteFile(fDir.Path("one/") + name, name);
+  TEntries const names = TOSSpecific::ListDir(fDir.Path("one"));
+  fs::create_directories(fDir.Path("two/") + names.back());  // where the last file is to be
+  EXPECT_STATUS(TOSSpecific::DirCopy(fDir.Path("one"), fDir.Path("two"), true), kZEPStatusFileSystemError);
+  EXPECT_EQ(ReadFile(fDir.Path("two/") + names[0]), names[0]);
+  EXPECT_EQ(ReadFile(fDir.Path("two/") + names[1]), names[1]);
 }
 
 // ---- ListDir ----
@@ -470,6 +469,15 @@ TEST_F(FilesTest, CreatedFileIsForItsOwnerToWrite) {
 }
 
 TEST_F(FilesTest, CreateFileThatCannotBeOpenedIsFalseWithTheReasonAtDebug) {
+  WriteFile(fDir.Path("write-only"), "old");  // it is opened for reading as well
+  fs::permissions(fDir.Path("write-only"), static_cast<fs::perms>(0222));
+  EXPECT_EQ(InChild([&] {
+              if (!BecomeUnprivileged()) return std::string("still root");
+              return std::string(TOSSpecific::createFile(fDir.Path("write-only"), "new") ? "created" : "not created");
+            }),
+            "not created");
+  EXPECT_EQ(ReadFile(fDir.Path("write-only")), "old");
+
   std::string const path = fDir.Path("missing/file");
   EXPECT_EQ(LogOf([&] { EXPECT_FALSE(TOSSpecific::createFile(path, "text")); }),
             (TEntries{"[Debug] Entering TOSSpecific::createFile, path=" + path, "[Debug] Unable to create file, errno=2"}));

@@ -249,9 +249,10 @@ TEST_F(SpawnProcessTest, LogsWhatItCalls) {
 }
 
 TEST_F(SpawnProcessTest, AChildEndedByASignalIsLogged) {
-  EXPECT_EQ(LogOf([] { EXPECT_EQ(RunChild("DiesBySignal", {"9"}).result, -1); }),
-            (TEntries{"[Debug] SpawnProcess: process " + Child("DiesBySignal"),
-                      "[Debug] ERROR: SpawnProcess - Child process exited abnormally!"}));
+  for (char const* signal : {"9", "15", "6"})  // that of 6 may be marked as one that left a core
+    EXPECT_EQ(LogOf([signal] { EXPECT_EQ(RunChild("DiesBySignal", {signal}).result, -1); }),
+              (TEntries{"[Debug] SpawnProcess: process " + Child("DiesBySignal"),
+                        "[Debug] ERROR: SpawnProcess - Child process exited abnormally!"}));
 }
 
 // ---- The time-out ----
@@ -547,6 +548,33 @@ TEST_F(SpawnProcessTest, TheCallersMemoryIsNotCopied) {
   long const after = faults();
   ::munmap(memory, kPages * kPageSize);
   EXPECT_LT(after - before, static_cast<long>(kPages / 10));
+}
+
+bool gForkHandlerRan = false;
+
+TEST_F(SpawnProcessTest, HandlersOfPthreadAtforkAreNotRun) {
+  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which may fork instead";
+  EXPECT_EQ(InChild([] {
+              ::pthread_atfork([] { gForkHandlerRan = true; }, nullptr, nullptr);
+              RunChild("PrintsNothing");
+              return gForkHandlerRan ? "run" : "not run";
+            }),
+            "not run");
+}
+
+int gExitStatus = -1;
+
+TEST_F(SpawnProcessTest, AFailedExecExitsWith255) {
+  EXPECT_EQ(InChild([] {
+              struct sigaction action = {};
+              action.sa_sigaction = [](int, siginfo_t* info, void*) { gExitStatus = info->si_status; };
+              action.sa_flags = SA_SIGINFO | SA_RESTART;
+              ::sigaction(SIGCHLD, &action, nullptr);
+              std::string output;
+              TOSSpecific::SpawnProcess("/nonexistent", {}, output, -1);
+              return std::to_string(gExitStatus);
+            }),
+            "255");
 }
 
 TEST_F(SpawnProcessTest, ServesManyThreads) {

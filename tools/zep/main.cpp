@@ -5,10 +5,12 @@
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
 #include <exception>
 #include <iostream>
 #include <map>
 #include <string>
+#include <vector>
 
 namespace NQRVZEP20::zep {
 
@@ -21,6 +23,20 @@ constexpr TCommand kCommands[] = {
     {"remote", "Tell which machines are behind management controllers", AddRemoteArguments},
     {"run", "Run a command as the library runs one, and print its output", AddRunArguments},
 };
+
+// The arguments, the last one first, as CLI11 takes them. It would hand what stands behind "--" to zep itself: of
+// "zep run [OPTIONS] -- COMMAND" the mark is left out, and the command begins all the same.
+std::vector<std::string> ArgumentsOf(int argc, char const* const* argv) {
+  std::vector<std::string> arguments(argv + 1, argv + argc);
+  if (!arguments.empty() && arguments.front() == "run") {
+    auto word = arguments.begin() + 1;
+    while (word != arguments.end() && word->rfind('-', 0) == 0 && *word != "--")
+      word += *word == "--timeout" && word + 1 != arguments.end() ? 2 : 1;
+    if (word != arguments.end() && *word == "--") arguments.erase(word);
+  }
+  std::reverse(arguments.begin(), arguments.end());
+  return arguments;
+}
 
 int Run(int argc, char const* const* argv) {
   CLI::App app("zep tells what a server knows of itself, through the provider plug-ins beside libzepcore.so.", "zep");
@@ -35,7 +51,7 @@ int Run(int argc, char const* const* argv) {
   }
 
   try {
-    app.parse(argc, argv);
+    app.parse(ArgumentsOf(argc, argv));
   } catch (CLI::ParseError const& stop) {
     bool const isAnswered = app.exit(stop, std::cout, std::cerr) == 0;  // --help, --version
     return isAnswered ? kExitComplete : kExitUsage;
