@@ -119,7 +119,7 @@ private:
   int fCurrentNode = -1;
   bool fIsResponseValid = false;
   std::uint64_t fSequence = 0;
-  IIPMILan* const fReplaced;  // the link before this one, so that what is never freed stays within reach
+  [[maybe_unused]] IIPMILan* const fReplaced;  // the link before this one, so that what is never freed stays within reach
 
   static IIPMILan* fgipmilanInstance;
 };
