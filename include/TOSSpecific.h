@@ -293,6 +293,21 @@ public:
   // The empty string that closes the set is none of its strings. Reads no byte behind `length`.
   static int getBIDString(char* stringSet, char* output, int length, int number);
 
+  // The identity of a remote server, read from the FRU data of its management controller over IPMI on the LAN (port 623)
+  // through the platform library libipmiClient.so. Each call opens a session of its own, in place of the one that was
+  // open, and leaves it open. Empty when no session could be opened, "N/A" when the controller could not be asked. Not
+  // from two threads at once.
+  static std::string GetRemoteMSN(std::string host, std::string user, std::string password);  // serial number, 7 characters
+  static std::string GetRemoteMT(std::string host, std::string user, std::string password);   // machine type, 4 characters
+  static std::string GetRemoteMachineModel(std::string host, std::string user, std::string password);
+
+  // Marks the start of a debug session: makes or truncates the file "<path><machine type><local time>.log", such as
+  // "/tmp/zep_123420240303-090507.log", where a null `path` stands for "/var/log/QRV_Support/zep_" (in the OEM variant
+  // "/var/log/OEM_Support/zep_"). The whole path is cut off after 255 bytes. Nothing is written to the file, and a failure
+  // to make it goes unnoticed. Then sets the logger's threshold to a `level` of 0 to 4 and returns true; any other level
+  // changes nothing and returns false.
+  static bool SetDebugLevel(int level, char* path);
+
   // ---- File transfer (TOSSpecificTransfer.cpp) ----
   //
   // By libcurl, which each call loads afresh and unloads again: the file libcurl.so or libcurl.so.4 beside the core library,
@@ -335,6 +350,7 @@ public:
   // 0 when the system knows an address of the host, 1 when not, whatever the name says; with a line in the log at debug
   // severity. The second argument is not used.
   static int DetectHostnameAvailable(std::string hostName, std::string unused);
+
   // ---- Removable media and devices (TOSSpecificMedia.cpp) ----
   //
   // Devices are mounted and unmounted by the system's own commands, run through the shell. Names are put into the command

@@ -15,6 +15,7 @@
 #include "ICIMPropertyDecl.h"
 #include "ICIMQualifier.h"
 #include "ICIMQualifierDecl.h"
+#include "IIPMILan.h"
 #include "ILogger.h"
 #include "INamespaceConsumer.h"
 #include "INamespaceProvider.h"

@@ -23,6 +23,7 @@ constexpr TCommand kCommands[] = {
     {"show", "Print one object or class of the providers' namespaces", AddShowArguments},
     {"media", "List, mount and unmount removable media", AddMediaArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},
+    {"remote", "Tell which machines are behind management controllers", AddRemoteArguments},
     {"run", "Run a command as the library runs one, and print its output", AddRunArguments},
     {"send", "Send a file to an FTP or SFTP server", AddSendArguments},
     {"get", "Fetch a file from an FTP or SFTP server", AddGetArguments},
