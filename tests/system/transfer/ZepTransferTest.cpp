@@ -140,6 +140,41 @@ TEST_F(ZepTransferTest, AFileThatIsThereIsLeftWhereNobodyCanAnswer) {
   EXPECT_EQ(Zep("get " + Url("f") + " " + dir_.Path("no/file")).exitCode, kNotWritten);
 }
 
+TEST_F(ZepTransferTest, OnlyARegularFileIsOverwritten) {
+  WriteFile(Remote("f"), "new");
+  std::string const fifo = dir_.Path("fifo"), device = dir_.Path("device"), nowhere = dir_.Path("nowhere");
+  ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
+  fs::create_symlink("/dev/null", device);
+  fs::create_symlink(dir_.Path("none"), nowhere);
+  struct TRow {
+    std::string file, named;
+  };
+  for (TRow const& row : {TRow{fifo, fifo}, TRow{device, "/dev/null"}, TRow{"/dev/null", "/dev/null"}, TRow{nowhere, nowhere}}) {
+    SCOPED_TRACE(row.file);
+    TProgramRun const run = Zep("get --force " + Url("f") + " " + row.file);
+    EXPECT_EQ(run.exitCode, kNotWritten);
+    EXPECT_EQ(run.output, "zep: " + row.named + " is no regular file\n");
+  }
+  EXPECT_EQ(NamesIn(dir_.Path()), (std::vector<std::string>{"device", "fifo", "nowhere"}));
+  EXPECT_TRUE(fs::is_character_file("/dev/null"));
+  EXPECT_TRUE(fs::is_fifo(fifo));
+}
+
+TEST_F(ZepTransferTest, ASymbolicLinkStaysAndWhatItLeadsToIsWritten) {
+  WriteFile(Remote("f"), "new");
+  fs::create_directory(dir_.Path("d"));
+  std::string const file = Local("d/f", "old");
+  fs::create_symlink("d/f", dir_.Path("link"));
+  TProgramRun const refused = Zep("get " + Url("f") + " " + dir_.Path("link"));
+  EXPECT_EQ(refused.exitCode, kNotWritten);
+  EXPECT_EQ(refused.output, "zep: " + file + " exists; --force overwrites it\n");
+  TProgramRun const fetched = Zep("get --force " + Url("f") + " " + dir_.Path("link"));
+  EXPECT_EQ(fetched.exitCode, kComplete) << fetched.output;
+  EXPECT_EQ(fs::read_symlink(dir_.Path("link")), "d/f");
+  EXPECT_EQ(ReadFile(file), "new");
+  EXPECT_EQ(NamesIn(dir_.Path()), (std::vector<std::string>{"d", "link"}));
+}
+
 TEST_F(ZepTransferTest, ABrokenDownloadIsMarked) {
   WriteFile(Remote("big"), std::string(3000000, 'x'));
   TServer const relay("relay.py", {"--ftp", "--control", "0", server_->Port(), "100000"});
