@@ -200,7 +200,8 @@ std::vector<TOperation> Operations() {
        {{"stat", "1", EACCES, {fileError + ", not all"}},
         {"open", "all", EACCES, {fileError + ", not all"}},
         {"copy_file_range", "all", EXDEV, {"copied, all"}},  // whatever the kernel did not copy is read and written
-        {"read", "1", EIO, {fileError + ", all"}},
+        {"read", "all", EIO, {fileError + ", all"}},
+        {"write", "1", ENOSPC, {fileError + ", all"}},  // of the last chunk, which is written once more
         {"close", "all", EIO, {"copied, all"}}}},
       {"DirCopy",
        {"0, text"},

@@ -2,6 +2,8 @@
 
 #include "tests/os/HostTools.h"
 
+#include <malloc.h>
+
 #include <random>
 
 namespace NQRVZEP20 {
@@ -191,6 +193,18 @@ TEST_F(TConfigTest, DestroyingAnotherDestroysTheInstanceAndKeepsItsAddress) {
               return TConfig::GetInstance() == instance ? "same address" : "another address";
             }),
             "same address");
+}
+
+TEST_F(TConfigTest, DestroyingAnotherFreesTheInstance) {
+  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, whose allocator does not tell how much is in use";
+  EXPECT_EQ(InChild([] {
+              WriteFile("zep.cfg", "a=" + std::string(100000, 'x'));
+              TConfig::GetInstance();
+              std::size_t const before = ::mallinfo2().uordblks;
+              { TConfig another; }
+              return before - ::mallinfo2().uordblks > 100000 ? "freed" : "kept";
+            }),
+            "freed");
 }
 
 }  // namespace

@@ -203,6 +203,23 @@ TEST_F(FilesTest, CopyToAFullDiskThrowsAndLeavesWhatFitted) {
   }
 }
 
+TEST_F(FilesTest, ALastChunkOfWhichOnlyAPartFittedIsACopy) {
+  NEEDS(MayMount(), "leave to mount a file system");
+  for (std::size_t const room : {std::size_t{192} << 10, std::size_t{2} << 20}) {
+    std::size_t const size = room + 5000;  // of its last chunk, 5,000 bytes, 4,096 find room
+    SCOPED_TRACE(size);
+    WriteFile(fDir.Path("source"), TextOf(size));
+    TTempDir const small;
+    std::string const mountSize = "size=" + std::to_string(room + 4096);
+    EXPECT_EQ(InChild([&] {
+                if (!MountTmpfs(small.Path(), mountSize.c_str())) return std::string("not mounted");
+                TOSSpecific::FileCopy(fDir.Path("source"), small.Path("copy"));
+                return std::to_string(ReadFile(small.Path("copy")).size());
+              }),
+              std::to_string(room + 4096));
+  }
+}
+
 TEST_F(FilesTest, CopyBeyondTheLargestSizeOfAFileThrowsAndLeavesWhatFitted) {
   for (std::size_t const size : {200000u, 2000000u}) {
     SCOPED_TRACE(size);

@@ -15,6 +15,7 @@
 #include <iostream>
 #include <map>
 #include <memory>
+#include <optional>
 
 namespace NQRVZEP20::zep {
 
@@ -23,7 +24,7 @@ namespace {
 constexpr char const* kFileName = "zep.cfg";
 
 struct TArguments {
-  std::string fKey;
+  std::optional<std::string> fKey;
   bool fAsJson = false;
 };
 
@@ -55,11 +56,15 @@ std::string ReasonToIgnore(std::string const& text, std::map<std::string, std::s
   return "";
 }
 
+// The library opens no other, so that a pipe of that name holds nobody up.
+bool IsReadByTheLibrary() { return TOSSpecific::FileExists(kFileName) && TOSSpecific::GetFileSize(kFileName) != 0; }
+
 // Values are the library's own; the file is read a second time for what it does not tell: the lines.
 TSettings ReadSettings() {
   TSettings settings{TOSSpecific::GetCurrentDir() + "/" + kFileName, {}, {}};
   std::map<std::string, std::size_t> lineOfKey;
-  std::ifstream file(kFileName);
+  std::ifstream file;
+  if (IsReadByTheLibrary()) file.open(kFileName);
   std::string text;
   for (std::size_t line = 1; std::getline(file, text); ++line) {
     std::string const key = text.substr(0, text.find('='));
@@ -126,13 +131,13 @@ std::string WhyNothing(TArguments const& arguments, TSettings const& settings) {
   if (!TOSSpecific::FileExists(kFileName)) return "there is no " + Printable(settings.fPath);
   if (TOSSpecific::GetFileSize(kFileName) == 0) return Printable(settings.fPath) + " is empty";
   if (!std::ifstream(kFileName)) return Printable(settings.fPath) + " cannot be read";
-  if (arguments.fKey.empty()) return "no line of " + Printable(settings.fPath) + " is a setting";
-  return Printable(settings.fPath) + " does not set \"" + Printable(arguments.fKey) + "\"";
+  if (!arguments.fKey) return "no line of " + Printable(settings.fPath) + " is a setting";
+  return Printable(settings.fPath) + " does not set \"" + Printable(*arguments.fKey) + "\"";
 }
 
 int Config(TArguments const& arguments) {
   TSettings settings = ReadSettings();
-  if (!arguments.fKey.empty()) KeepOnly(arguments.fKey, settings);
+  if (arguments.fKey) KeepOnly(*arguments.fKey, settings);
   bool const isAnything = !settings.fSettings.empty() || !settings.fIgnored.empty();
   if (isAnything || arguments.fAsJson) WriteOutput(arguments.fAsJson ? AsJson(settings) : AsText(settings));
   if (!settings.fSettings.empty()) return kExitComplete;

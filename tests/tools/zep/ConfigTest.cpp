@@ -3,6 +3,7 @@
 #include "tests/tools/zep/Zep.h"
 
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 namespace NQRVZEP20::zep {
 namespace {
@@ -109,12 +110,24 @@ TEST_F(ConfigTest, SaysWhyThereIsNothing) {
   EXPECT_EQ(run.output, "");
   EXPECT_EQ(run.errors, "zep: " + File() + " does not set \"b\"\n");
 
+  run = Run({""});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, "");
+  EXPECT_EQ(run.errors, "zep: " + File() + " does not set \"\"\n");
+
   fs::permissions(dir_.Path(), fs::perms::all);
   fs::permissions(File(), fs::perms::none);
   run = Run({"--json"}, true);
   EXPECT_EQ(run.status, 1);
   EXPECT_TRUE(JsonOf(run)["settings"].empty());
   EXPECT_EQ(run.errors, "zep: " + File() + " cannot be read\n");
+}
+
+TEST_F(ConfigTest, APipeOfThatNameIsNotWaitedFor) {
+  ASSERT_EQ(::mkfifo(File().c_str(), 0600), 0);
+  TRun const run = Run({});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors, "zep: " + File() + " is empty\n");
 }
 
 TEST_F(ConfigTest, TakesOneKeyOnly) { EXPECT_EQ(Run({"a", "b"}).status, 64); }
