@@ -1,0 +1,77 @@
+#include "ICIMClass.h"
+#include "ICIMInstance.h"
+#include "ICIMQualifierDecl.h"
+#include "Mof.h"
+#include "TAddToVectorCallback.h"
+#include "TMofWriter.h"
+
+#include <map>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+using TClasses = std::vector<boost::shared_ptr<ICIMClass>>;
+using TInstances = std::vector<boost::shared_ptr<ICIMInstance>>;
+
+const TCIMContext kNone;
+
+TClasses RootClassesOf(ICIMNamespace const& ns) {
+  TClasses roots;
+  ns.EnumerateClasses(TAddToVectorCallback<ICIMClass>(roots), kNone);
+  return roots;
+}
+
+// Plain classes first and then associations, each below its superclass: what is referred to is above, and what a copy has
+// made comes in the same order.
+TClasses InWrittenOrder(TClasses const& roots) {
+  TClasses all, ordered;
+  for (auto const& root : roots) {
+    all.push_back(root);
+    root->EnumerateSubClasses(TAddToVectorCallback<ICIMClass>(all), kNone);
+  }
+  for (const bool areAssociations : {false, true})
+    for (auto const& cls : all)
+      if (cls->GetClassFlag(kNone) == areAssociations) ordered.push_back(cls);
+  return ordered;
+}
+
+std::map<std::string, TInstances> InstancesByClass(TClasses const& roots) {
+  std::map<std::string, TInstances> instances;
+  for (auto const& root : roots)
+    root->EnumerateInstances(
+        [&](boost::shared_ptr<ICIMInstance> instance) {
+          instances[instance->GetClass(kNone)->GetName(kNone)].push_back(instance);
+          return true;
+        },
+        kNone);
+  return instances;
+}
+
+}  // namespace
+
+std::string WriteMof(ICIMNamespace const& ns) {
+  TMofWriter writer;
+  ns.EnumerateQualifierDecls(
+      [&](boost::shared_ptr<ICIMQualifierDecl> decl) {
+        writer.WriteQualifierDecl(*decl);
+        return true;
+      },
+      kNone);
+  const TClasses roots = RootClassesOf(ns);
+  const TClasses classes = InWrittenOrder(roots);
+  for (auto const& cls : classes) writer.WriteClass(*cls);
+  std::map<std::string, TInstances> instances = InstancesByClass(roots);
+  for (auto const& cls : classes)
+    for (auto const& instance : instances[cls->GetName(kNone)]) writer.WriteInstance(*instance);
+  return writer.GetText();
+}
+
+std::string WriteMofClass(ICIMClass const& cls) {
+  TMofWriter writer;
+  writer.WriteClass(cls);
+  return writer.GetText();
+}
+
+}  // namespace NQRVZEP20
