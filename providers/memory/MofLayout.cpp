@@ -42,17 +42,19 @@ std::string StringText(std::string const& text, std::size_t column, std::size_t 
 
 }  // namespace
 
+// An item of several lines begins one of its own, and so does what follows it.
 std::string MofList(std::vector<std::string> const& items, std::size_t column, std::size_t indent) {
   std::string list;
+  bool wasBroken = false;
   for (std::size_t at = 0; at < items.size(); ++at) {
     const std::string item = items[at] + (at + 1 < items.size() ? "," : "");
-    const std::size_t firstLine = std::min(item.find('\n'), item.size());
-    const bool fits = column + 1 + firstLine <= kWidth;
+    const bool isBroken = item.find('\n') != item.npos;
+    const bool fits = !isBroken && !wasBroken && column + 1 + item.size() <= kWidth;
     if (at > 0) list += fits ? " " : NewLine(indent);
-    column = at == 0 ? column : fits ? column + 1 : indent;
+    if (at > 0) column = fits ? column + 1 : indent;
     list += item;
-    const std::size_t lastLine = item.rfind('\n');
-    column = lastLine == item.npos ? column + item.size() : item.size() - lastLine - 1;
+    column += item.size();
+    wasBroken = isBroken;
   }
   return list;
 }

@@ -25,7 +25,7 @@ fs::path RegularFile(fs::path const& path, int& error) {
   std::error_code failure;
   const fs::path canonical = fs::canonical(path, failure);
   const bool isRegular = !failure && fs::is_regular_file(canonical, failure);
-  error = failure ? failure.value() : isRegular ? 0 : EINVAL;
+  error = failure ? failure.value() : isRegular ? 0 : fs::is_directory(canonical) ? EISDIR : EINVAL;
   return error == 0 ? canonical : fs::path();
 }
 

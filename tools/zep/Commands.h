@@ -18,9 +18,11 @@ struct TCommand {
   TRun (*fAddArguments)(CLI::App& command);
 };
 
-TRun AddConfigArguments(CLI::App& command);  // ConfigCommand.cpp
-TRun AddReportArguments(CLI::App& command);  // ReportCommand.cpp
-TRun AddRunArguments(CLI::App& command);     // RunCommand.cpp
-TRun AddShowArguments(CLI::App& command);    // ShowCommand.cpp
+TRun AddClassesArguments(CLI::App& command);  // ClassesCommand.cpp
+TRun AddConfigArguments(CLI::App& command);   // ConfigCommand.cpp
+TRun AddMofArguments(CLI::App& command);      // MofCommand.cpp
+TRun AddReportArguments(CLI::App& command);   // ReportCommand.cpp
+TRun AddRunArguments(CLI::App& command);      // RunCommand.cpp
+TRun AddShowArguments(CLI::App& command);     // ShowCommand.cpp
 
 }  // namespace NQRVZEP20::zep
