@@ -1,6 +1,6 @@
 // Object paths in the form of DSP0004.
 
-#include "CIMTypes.h"
+#include "CIMNames.h"
 #include "ICIMClass.h"
 #include "ICIMPropertyDecl.h"
 #include "MofNumbers.h"
@@ -28,7 +28,7 @@ public:
       if (Take(TMofToken::kMark).fText != "=") Refuse(name);
       const std::string key(name.fText);
       const auto type = path.GetClass()->GetPropertyDecl(key, kNone)->GetType(kNone);
-      path.AddKeyValue(key, ReadMofValue(TakeValue(), type, 0, fNamespace));
+      path.AddKeyValue(key, ReadMofValue(TakeValue(type), type, 0, fNamespace));
     }
   }
 
@@ -45,20 +45,21 @@ private:
     return token.fKind != TMofToken::kEnd;
   }
 
-  TMofValue TakeValue() {
+  TMofValue TakeValue(TCIMValue::TCIMType type) {
     const TMofToken token = fLexer.Next();
     TMofLiteral literal{TMofLiteral::kNull, {&fKeys, token.fText}, {}};
-    if (token.fKind == TMofToken::kNumber)
-      literal.fKind = TMofLiteral::kNumber;
-    else if (token.fKind == TMofToken::kChar)
-      literal.fKind = TMofLiteral::kChar;
-    else if (token.fKind == TMofToken::kName && (token.fText == "TRUE" || token.fText == "FALSE"))
-      literal.fKind = TMofLiteral::kBoolean;
-    else if (token.fKind == TMofToken::kString) {
+    const bool isQuoted = token.fKind == TMofToken::kString;
+    if (isQuoted && type >= TCIMValue::TCIMType::kCIMTypeString) {
       literal.fKind = TMofLiteral::kString;
       AppendUnescaped(literal.fString, literal.fPlace);
-    } else
-      Refuse(token);
+    } else if (token.fKind == TMofToken::kChar)
+      literal.fKind = TMofLiteral::kChar;
+    else {  // a word or a number, which may stand in quotes
+      if (isQuoted) literal.fPlace.fText = token.fText.substr(1, token.fText.size() - 2);
+      const std::string word(literal.fPlace.fText);
+      literal.fKind = IsSameName(word, "true") || IsSameName(word, "false") ? TMofLiteral::kBoolean : TMofLiteral::kNumber;
+      if (word.empty()) Refuse(token);
+    }
     return {literal.fPlace, false, {literal}};
   }
 

@@ -5,6 +5,7 @@
 #include "TAddToVectorCallback.h"
 #include "TMofWriter.h"
 
+#include <algorithm>
 #include <map>
 #include <vector>
 
@@ -17,24 +18,25 @@ using TInstances = std::vector<boost::shared_ptr<ICIMInstance>>;
 
 const TCIMContext kNone;
 
+bool IsPlain(boost::shared_ptr<ICIMClass> const& cls) { return !cls->GetClassFlag(kNone); }
+
+// Plain ones first: that is the order in which a copy makes them.
 TClasses RootClassesOf(ICIMNamespace const& ns) {
   TClasses roots;
   ns.EnumerateClasses(TAddToVectorCallback<ICIMClass>(roots), kNone);
+  std::stable_partition(roots.begin(), roots.end(), IsPlain);
   return roots;
 }
 
-// Plain classes first and then associations, each below its superclass: what is referred to is above, and what a copy has
-// made comes in the same order.
+// Plain classes first and then associations, each below its superclass: what is referred to is above.
 TClasses InWrittenOrder(TClasses const& roots) {
-  TClasses all, ordered;
+  TClasses all;
   for (auto const& root : roots) {
     all.push_back(root);
     root->EnumerateSubClasses(TAddToVectorCallback<ICIMClass>(all), kNone);
   }
-  for (const bool areAssociations : {false, true})
-    for (auto const& cls : all)
-      if (cls->GetClassFlag(kNone) == areAssociations) ordered.push_back(cls);
-  return ordered;
+  std::stable_partition(all.begin(), all.end(), IsPlain);
+  return all;
 }
 
 std::map<std::string, TInstances> InstancesByClass(TClasses const& roots) {
