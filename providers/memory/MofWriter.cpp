@@ -28,12 +28,30 @@ TClasses RootClassesOf(ICIMNamespace const& ns) {
   return roots;
 }
 
+// The direct subclasses of each class, plain ones first, by the name of the class.
+std::map<std::string, TClasses> SubClassesOf(TClasses const& roots) {
+  std::map<std::string, TClasses> subClasses;
+  for (auto const& root : roots)
+    root->EnumerateSubClasses(
+        [&](boost::shared_ptr<ICIMClass> cls) {
+          subClasses[cls->GetSuperClass(kNone)->GetName(kNone)].push_back(cls);
+          return true;
+        },
+        kNone);
+  for (auto& [name, classes] : subClasses) std::stable_partition(classes.begin(), classes.end(), IsPlain);
+  return subClasses;
+}
+
 // Plain classes first and then associations, each below its superclass: what is referred to is above.
 TClasses InWrittenOrder(TClasses const& roots) {
+  const std::map<std::string, TClasses> subClasses = SubClassesOf(roots);
   TClasses all;
-  for (auto const& root : roots) {
-    all.push_back(root);
-    root->EnumerateSubClasses(TAddToVectorCallback<ICIMClass>(all), kNone);
+  TClasses pending(roots.rbegin(), roots.rend());  // the next one last
+  while (!pending.empty()) {
+    all.push_back(pending.back());
+    pending.pop_back();
+    const auto below = subClasses.find(all.back()->GetName(kNone));
+    if (below != subClasses.end()) pending.insert(pending.end(), below->second.rbegin(), below->second.rend());
   }
   std::stable_partition(all.begin(), all.end(), IsPlain);
   return all;

@@ -10,8 +10,6 @@
 #include "MofValues.h"
 #include "TMofInstances.h"
 
-#include <algorithm>
-
 namespace NQRVZEP20 {
 
 namespace {
@@ -21,15 +19,6 @@ using TType = TCIMValue::TCIMType;
 const TCIMContext kNone;
 
 std::string NameAt(TMofPlace const& place) { return std::string(place.fText); }
-
-// Whether a property carries the qualifier Static: its value belongs to the class then.
-bool IsStatic(TMofQualifiers const& qualifiers) {
-  return std::any_of(qualifiers.begin(), qualifiers.end(), [](TMofQualifier const& qualifier) {
-    const bool isFalse = qualifier.fValue && qualifier.fValue->fLiterals.size() == 1 &&
-                         IsSameName(NameAt(qualifier.fValue->fLiterals.front().fPlace), "false");
-    return !isFalse && qualifier.fName.fText.size() == 6 && IsSameName(NameAt(qualifier.fName), "Static");
-  });
-}
 
 }  // namespace
 
@@ -70,7 +59,7 @@ void TMofBuilder::AddProperty(TMofFeature const& property, ICIMClass& cls) {
     const TCIMValue written = ReadMofValue(*property.fDefault, property.fType.fType, property.fType.fMaxArraySize, fNamespace);
     if (written.IsReference() && !written.IsNull() && written.GetReferencedClass() != value.GetReferencedClass())
       throw TMofError(property.fDefault->fPlace, "expected an object of the class itself that the reference refers to");
-    TCIMValue& target = IsStatic(property.fQualifiers) ? staticValue : value;
+    TCIMValue& target = HasStatic(property.fQualifiers) ? staticValue : value;
     if (!written.IsNull()) target = TCIMValue(written);
   }
   const auto made = AtPlace(property.fName, kZEPStatusAlreadyExists, "is declared already in this class",
@@ -126,6 +115,13 @@ TMofBuilder::TDeclaredQualifier const& TMofBuilder::Declared(TMofPlace const& na
 boost::shared_ptr<ICIMClass> TMofBuilder::FindClass(TMofPlace const& name) const {
   return AtPlace(name, kZEPStatusNotFound, "is no class that is declared",
                  [&] { return fNamespace->GetClass(NameAt(name), kNone); });
+}
+
+// Whether they make the value of a property one of the class.
+bool TMofBuilder::HasStatic(TMofQualifiers const& qualifiers) {
+  for (TMofQualifier const& qualifier : qualifiers)
+    if (IsSameName(NameAt(qualifier.fName), "Static")) return ValueOf(qualifier, Declared(qualifier.fName)) == TCIMValue(true);
+  return false;
 }
 
 TCIMValue TMofBuilder::NullOfProperty(TMofType const& type) const {

@@ -38,6 +38,7 @@ private:
   void AddParameter(TMofParameter const& parameter, ICIMMethodDecl& method);
   void AddQualifiers(TMofQualifiers const& qualifiers, ICIMNamedElement& element);
   TCIMValue ValueOf(TMofQualifier const& qualifier, TDeclaredQualifier const& declared) const;
+  bool HasStatic(TMofQualifiers const& qualifiers);
   TDeclaredQualifier const& Declared(TMofPlace const& name);
   boost::shared_ptr<ICIMClass> FindClass(TMofPlace const& name) const;
   TCIMValue NullOfProperty(TMofType const& type) const;

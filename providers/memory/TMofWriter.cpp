@@ -51,7 +51,8 @@ std::string ArrayMark(TType type, unsigned int maxArraySize) {
 
 std::string TypeText(TType type, std::string const& referencedClass) {
   if (BaseTypeOf(type) != TType::kCIMTypeReference) return type.ToString();
-  if (referencedClass.empty()) ThrowUnprintable();
+  const TType sameName(referencedClass);  // a class that is called as a type would be taken for it
+  if (referencedClass.empty() || HasTypeName(sameName)) ThrowUnprintable();
   return referencedClass + " REF";
 }
 

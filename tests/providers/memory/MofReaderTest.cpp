@@ -187,7 +187,8 @@ TEST(MofReaderTest, AQualifierHasTheDeclaredFlavorUnlessItNamesItsOwn) {
 }
 
 TEST(MofReaderTest, TheValueOfAStaticPropertyIsThatOfTheClass) {
-  const auto ns = Read("class X_A { [Static] uint16 Count = 3; [Static(false)] uint16 Plain = 4; };");
+  const auto ns =
+      Read("class X_A { [Static] uint16 Count = 3; [Static(false)] uint16 Plain = 4; [Static(null)] uint8 No = 5; };");
   const auto statics = All(*ns->GetClass("X_A", kNone), &ICIMClass::EnumerateStaticProperties);
   ASSERT_EQ(statics.size(), 1u);
   EXPECT_EQ(statics.front()->GetName(kNone), "Count");

@@ -225,6 +225,19 @@ TEST(MofWriterTest, PlainClassesStandAboveAssociationsAndACopyHasTheSameText) {
   EXPECT_EQ(WriteMof(*ReadBack(text)), text);
 }
 
+// Where an association is a subclass of a plain class, the copy comes to it later than the source.
+TEST(MofWriterTest, ACopyHasTheSameTextWhereKindsAreMixed) {
+  const auto ns = NewNamespace();
+  ns->DefineClass("X_Top");
+  ns->DefineClass("X_Link", "X_Top").Association();
+  ns->DefineClass("X_Plain", "X_Top");
+  ns->DefineClass("X_LowLink", "X_Plain").Association();
+  const auto copy = NewNamespace();
+  TCIMCopy::CopyClasses(ns, copy, false);
+  EXPECT_EQ(WriteMof(*copy), WriteMof(*ns));
+  EXPECT_EQ(WriteMof(*ReadBack(WriteMof(*ns))), WriteMof(*ns));
+}
+
 TEST(MofWriterTest, WhatMofCannotSayIsRefused) {
   using TDefine = std::function<void(TMemoryNamespace&)>;
   const std::pair<char const*, TDefine> rows[] = {
@@ -238,6 +251,11 @@ TEST(MofWriterTest, WhatMofCannotSayIsRefused) {
        [](TMemoryNamespace& ns) { ns.DefineClass("X_A").Method("M", TType::kCIMTypeReference); }},
       {"a parameter that refers to no class",
        [](TMemoryNamespace& ns) { ns.DefineClass("X_A").Method("M", "uint8").In("P", "reference"); }},
+      {"a reference to a class that is called as a type",
+       [](TMemoryNamespace& ns) {
+         ns.DefineClass("string");
+         ns.DefineClass("X_A").Reference("P", "string");
+       }},
       {"a static value of an inherited property",
        [](TMemoryNamespace& ns) {
          ns.DefineClass("X_A").Static("P", "uint16", 1);
