@@ -4,8 +4,8 @@
 #include "TRootObject.h"
 #include "TZEPException.h"
 
-#include <cstdio>
 #include <cstdlib>
+#include <iostream>
 #include <locale>
 #include <sstream>
 
@@ -20,12 +20,6 @@ std::string MessageOf(char const* expr, char const* function, char const* file, 
   return message.str();
 }
 
-// Not through std::cerr: its header makes the standard streams when the library is loaded, a third of the time of that.
-void PrintError(std::string const& text) {
-  std::fwrite(text.data(), 1, text.size(), stderr);
-  std::fflush(stderr);
-}
-
 void HandleFailedAssertion(char const* expr, char const* function, char const* file, long line) {
   char const* const setting = std::getenv("ZEP_BOOST_ASSERT");
   std::string const mode = setting ? setting : "throwzep";
@@ -35,14 +29,15 @@ void HandleFailedAssertion(char const* expr, char const* function, char const* f
   if (mode == "throwzep") throw TZEPException(kZEPStatusFail);
   if (mode == "throwboost") throw TBoostAssertException(message);
   if (mode == "trap") {
-    PrintError("\n" + message + "\n\nForcing segmentation fault.\n");
+    std::cerr << std::endl << message << std::endl << std::endl << "Forcing segmentation fault." << std::endl;
     return;  // no fault is raised: the caller goes on. Kept.
   }
   if (mode == "exit") {
-    PrintError("\n" + message + "\n");
+    std::cerr << std::endl << message << std::endl;
     std::exit(1);
   }
-  PrintError("Invalid setting for ZEP_BOOST_ASSERT '" + mode + "'. Valid values are {throwzep, throwboost, trap, exit}.\n");
+  std::cerr << "Invalid setting for ZEP_BOOST_ASSERT '" << mode << "'. Valid values are {throwzep, throwboost, trap, exit}."
+            << std::endl;
   throw TZEPException(kZEPStatusFail);
 }
 

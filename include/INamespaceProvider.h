@@ -14,8 +14,8 @@ public:
   virtual std::string const& GetName(TCIMContext const& context) const = 0;
 
   // The namespace that the provider owns; the same one at each call. The first call may take as long as collecting the
-  // data takes.
-  virtual boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) = 0;
+  // data takes. Empty where the provider owns none that others may see.
+  virtual boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& /*context*/) { return {}; }
 };
 
 }  // namespace NQRVZEP20

@@ -24,6 +24,8 @@ public:
 
   // True whatever the codes are, for both. Throws kZEPStatusInvalidDateTime (a datetime's code, kept) when either
   // character is NULL. An empty pointer is a failed assertion.
+  bool operator==(TCIMChar16Impl const& other) const;
+  bool operator<(TCIMChar16Impl const& other) const;
   bool operator==(boost::shared_ptr<TCIMChar16Impl> const& other) const;
   bool operator<(boost::shared_ptr<TCIMChar16Impl> const& other) const;
 

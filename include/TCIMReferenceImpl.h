@@ -6,6 +6,9 @@
 
 #include <cstddef>
 #include <functional>
+#include <string>
+#include <utility>
+#include <vector>
 
 namespace NQRVZEP20 {
 
@@ -26,6 +29,9 @@ public:
   // opening quote of a reference that is a key's value in an enclosing path: reading then ends on the closing quote, or at
   // the end of the path, where a missing quote is not noticed.
   static void ParsePath(TCIMReferenceImpl& target, std::string const& path, std::size_t& pos);
+  static void ParsePath(TCIMReference& target, std::string const& path, std::size_t& pos) {
+    ParsePath(*target.GetBody(), path, pos);
+  }
 
   std::string GetPath() const;
   void SetPath(std::string const& path);
@@ -52,6 +58,9 @@ public:
   bool operator<(TCIMReferenceImpl const& other) const;
 
 private:
+  using TKeyBindings = std::vector<std::pair<std::string, TCIMValue>>;
+
+  void AddKey(std::string&& name, TCIMValue&& value);
   void LookUpClass(ICIMNamespace const& ns, std::string const& name);
 
   // The steps of ParsePath.
@@ -64,7 +73,7 @@ private:
   boost::weak_ptr<ICIMNamespace> fNamespace;
   TCIMContext fContext;                     // handed to the namespace when a class is looked up
   boost::shared_ptr<ICIMClass> fClass;      // empty until set; not changed while there are keys
-  std::map<std::string, TCIMValue> fKeys;   // by name, in byte order
+  TKeyBindings fKeys;                       // by name, in byte order
   boost::shared_ptr<ICIMElement> fElement;  // the instance, once found; never looked up again
   std::string fNamespaceName;               // the caller's label; has nothing to do with fNamespace
   int fDepth = 0;                           // how many paths that are being read this one stands in

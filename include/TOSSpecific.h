@@ -260,7 +260,8 @@ public:
   // The machine type that the BIOS build prefix stands for, else what GetMachineType gives.
   static std::string GetMachineTypeFromID();
 
-  // The first two characters of the BIOS version of SMBIOS type 0, taken out of its brackets; "00" when there are no two.
+  // The first two characters of the BIOS version of SMBIOS type 0, taken out of its brackets, or its only one; "00" when
+  // it has none or cannot be read.
   static std::string GetBiosID();
 
   // Copies string `number` (1 is the first) of an SMBIOS string set of `length` bytes into `output`, which has room for

@@ -58,6 +58,7 @@ enum EZEPStatusCode : int {
 class ZEP_EXPORT TZEPStatusCode {
 public:
   TZEPStatusCode(EZEPStatusCode code = kZEPStatusOK) noexcept : fCode(code) {}
+  TZEPStatusCode(int code) noexcept : fCode(static_cast<EZEPStatusCode>(code)) {}
 
   EZEPStatusCode GetCode() const noexcept { return fCode; }
 

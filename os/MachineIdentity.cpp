@@ -30,7 +30,7 @@ TStructureStrings::TStructureStrings(std::string_view structure) {
   fStrings = SplitStringSet(structure.substr(fFormattedArea.size()));
 }
 
-std::optional<std::string> TStructureStrings::NamedAt(std::size_t offset) const {
+std::optional<std::string_view> TStructureStrings::NamedAt(std::size_t offset) const {
   if (offset >= fFormattedArea.size()) return std::nullopt;
   const std::size_t number = ByteAt(fFormattedArea, offset);
   if (number == 0 || number > fStrings.size()) return std::nullopt;

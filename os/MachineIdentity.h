@@ -21,8 +21,8 @@ public:
   explicit TStructureStrings(std::string_view structure);
 
   // The string whose number (1 is the first) the byte at `offset` holds. Nothing when that byte is not in the formatted
-  // area, and for a number of 0 or past the last string.
-  std::optional<std::string> NamedAt(std::size_t offset) const;
+  // area, and for a number of 0 or past the last string. It lies in this object.
+  std::optional<std::string_view> NamedAt(std::size_t offset) const;
 
 private:
   std::string_view fFormattedArea;

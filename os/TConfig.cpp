@@ -75,9 +75,10 @@ std::uint64_t HeadOf(std::string_view text) {
 void SortByKey(std::vector<TSetting>& settings) {
   std::size_t const commonLength = LengthOfCommonStart(settings);
   for (TSetting& setting : settings) setting.fHead = HeadOf(setting.fKey.substr(commonLength));
-  std::stable_sort(settings.begin(), settings.end(), [](TSetting const& left, TSetting const& right) {
+  auto const isBefore = [](TSetting const& left, TSetting const& right) {
     return left.fHead != right.fHead ? left.fHead < right.fHead : left.fKey < right.fKey;
-  });
+  };
+  if (!std::is_sorted(settings.begin(), settings.end(), isBefore)) std::stable_sort(settings.begin(), settings.end(), isBefore);
 }
 
 }  // namespace

@@ -234,6 +234,7 @@ std::vector<std::string> TOSSpecific::multiStringTok(char* buffer, unsigned long
   // A string that ends at this mark or behind it is not taken, so nothing from the mark on is looked at.
   char const* const endMark = buffer + length - 2;
   char const* start = buffer;
+  strings.reserve(8);  // more than most sets have
   for (char const* end = std::find(start, endMark, separator); end != endMark; end = std::find(start, endMark, '\0')) {
     strings.emplace_back(start, end);
     start = end + 1;

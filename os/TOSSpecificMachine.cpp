@@ -65,10 +65,10 @@ TMachineIdentity ReadMachineIdentity(EIdentityLog logged) {
   }
 
   const TStructureStrings strings({buffer.get(), static_cast<std::size_t>(length)});
-  const std::string productDescription = strings.NamedAt(kProductName).value_or("");
+  const std::string productDescription(strings.NamedAt(kProductName).value_or(""));
   ReadProductDescription(productDescription, identity);
   if (logged == EIdentityLog::kAll) LogIdentity(productDescription, identity);
-  identity.serialNumber = strings.NamedAt(kSerialNumber).value_or(identity.serialNumber);
+  if (const std::optional<std::string_view> number = strings.NamedAt(kSerialNumber)) identity.serialNumber = *number;
 
   LogDebug("Machine type detected: ", identity.type);
   tables.Close();

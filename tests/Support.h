@@ -5,12 +5,14 @@
 #include "ILogger.h"
 #include "TLogger.h"
 #include "TRootObject.h"
-#include "TestPaths.h"
 #include "TZEPException.h"
+#include "TestPaths.h"
 
 #include <gtest/gtest.h>
 #include <stdlib.h>
 
+#include <cstdint>
+#include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <functional>
@@ -22,16 +24,16 @@
 namespace NQRVZEP20 {
 
 // Expects that the statement throws TZEPException with that status.
-#define EXPECT_STATUS(statement, status)                                             \
-  EXPECT_THROW(                                                                      \
-      {                                                                              \
-        try {                                                                        \
-          statement;                                                                 \
-        } catch (::NQRVZEP20::TZEPException const& thrown) {                         \
-          EXPECT_STREQ(thrown.what(), ::NQRVZEP20::TZEPException(status).what());    \
-          throw;                                                                     \
-        }                                                                            \
-      },                                                                             \
+#define EXPECT_STATUS(statement, status)                                          \
+  EXPECT_THROW(                                                                   \
+      {                                                                           \
+        try {                                                                     \
+          statement;                                                              \
+        } catch (::NQRVZEP20::TZEPException const& thrown) {                      \
+          EXPECT_STREQ(thrown.what(), ::NQRVZEP20::TZEPException(status).what()); \
+          throw;                                                                  \
+        }                                                                         \
+      },                                                                          \
       ::NQRVZEP20::TZEPException)
 
 // Skips the test, saying why, when what it needs is not there; with CI=true it fails instead.
@@ -43,6 +45,14 @@ namespace NQRVZEP20 {
       GTEST_SKIP() << (reason);                                                         \
     }                                                                                   \
   } while (false)
+
+// The place of a virtual operation in the virtual table, counted from 1: what a pointer to it holds on this platform.
+template <class TMember>
+std::size_t SlotOf(TMember member) {
+  std::uintptr_t offset = 0;
+  std::memcpy(&offset, &member, sizeof offset);
+  return (offset - 1) / sizeof(void*) + 1;
+}
 
 // A fresh directory, removed with everything in it at the end.
 class TTempDir {

@@ -36,15 +36,16 @@ bool IsEndOfKeys(std::string const& path, std::size_t pos, bool isNested) {
 // backslash is kept, with what follows it.
 std::string ReadQuotedText(std::string const& path, std::size_t& pos) {
   std::string text;
-  for (++pos; pos < path.size() && path[pos] != '"'; ++pos) {
-    if (path[pos] == '\\') {
-      if (++pos == path.size()) break;
-      if (path[pos] != '"' && path[pos] != '\\') text += '\\';
-    }
+  for (++pos; pos < path.size(); ++pos) {
+    std::size_t const start = pos;
+    while (pos < path.size() && path[pos] != '"' && path[pos] != '\\') ++pos;
+    text.append(path, start, pos - start);
+    if (pos < path.size() && path[pos] == '"') return text;
+    if (++pos >= path.size()) break;
+    if (path[pos] != '"' && path[pos] != '\\') text += '\\';
     text += path[pos];
   }
-  if (pos >= path.size()) ThrowInvalidReference("Reference missing closing '\"', path=", path);
-  return text;
+  ThrowInvalidReference("Reference missing closing '\"', path=", path);
 }
 
 TCIMValue ReadValue(boost::shared_ptr<ICIMNamespace> const& ns, ICIMPropertyDecl const& declaration, std::string const& path,
@@ -68,8 +69,9 @@ boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(ICIMClass const& cls, s
   return declaration;
 }
 
-// What std::map's own < says, with each name compared once.
-bool AreKeysLess(std::map<std::string, TCIMValue> const& a, std::map<std::string, TCIMValue> const& b) {
+// What the < of two vectors says, with each name compared once.
+template <class TKeyBindings>
+bool AreKeysLess(TKeyBindings const& a, TKeyBindings const& b) {
   auto mine = a.begin();
   auto theirs = b.begin();
   for (; mine != a.end() && theirs != b.end(); ++mine, ++theirs) {
@@ -165,7 +167,7 @@ std::size_t TCIMReferenceImpl::ReadKeyBinding(boost::shared_ptr<ICIMNamespace> c
 
   bool const isReference = declaration->GetDefaultValue(TCIMContext()).IsReference();
   TCIMValue value = isReference ? ReadReference(ns, path, pos) : ReadValue(ns, *declaration, path, pos);
-  fKeys.emplace(std::move(name), std::move(value));  // the first binding of a name stays. Kept.
+  AddKey(std::move(name), std::move(value));
   return std::min(pos + 1, path.size());
 }
 
@@ -217,12 +219,20 @@ void TCIMReferenceImpl::AddKeyValue(std::string const& name, TCIMValue const& va
     LogError(TypeMismatchText(declared, value.GetType()));
     throw TZEPException(kZEPStatusTypeMismatch);
   }
-  fKeys.emplace(name, value);  // the first binding of a name stays. Kept.
+  AddKey(std::string(name), TCIMValue(value));
+}
+
+void TCIMReferenceImpl::AddKey(std::string&& name, TCIMValue&& value) {
+  if (fKeys.empty()) fKeys.reserve(4);  // more than most classes have
+  auto const place =
+      std::lower_bound(fKeys.begin(), fKeys.end(), name, [](auto const& key, auto const& wanted) { return key.first < wanted; });
+  if (place != fKeys.end() && place->first == name) return;  // the first binding of a name stays. Kept.
+  fKeys.emplace(place, std::move(name), std::move(value));
 }
 
 void TCIMReferenceImpl::EnumerateKeyBindings(boost::function<bool(std::pair<std::string, TCIMValue>)> callback) const {
-  for (auto const& key : fKeys)
-    if (!callback(key)) return;
+  for (std::size_t i = 0; i < fKeys.size(); ++i)  // the callback may add keys
+    if (!callback(fKeys[i])) return;
 }
 
 void TCIMReferenceImpl::Clear() {

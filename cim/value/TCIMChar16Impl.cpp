@@ -20,14 +20,24 @@ std::string TCIMChar16Impl::ToString() const {
 
 // Neither comparison looks at the codes. Kept.
 
-bool TCIMChar16Impl::operator==(boost::shared_ptr<TCIMChar16Impl> const& other) const {
-  RefuseNull(fIsNull || other->fIsNull);
+bool TCIMChar16Impl::operator==(TCIMChar16Impl const& other) const {
+  RefuseNull(fIsNull || other.fIsNull);
   return true;
 }
 
-bool TCIMChar16Impl::operator<(boost::shared_ptr<TCIMChar16Impl> const& other) const {
-  RefuseNull(fIsNull || other->fIsNull);
+bool TCIMChar16Impl::operator<(TCIMChar16Impl const& other) const {
+  RefuseNull(fIsNull || other.fIsNull);
   return true;
+}
+
+bool TCIMChar16Impl::operator==(boost::shared_ptr<TCIMChar16Impl> const& other) const {
+  RefuseNull(fIsNull);
+  return *this == *other;
+}
+
+bool TCIMChar16Impl::operator<(boost::shared_ptr<TCIMChar16Impl> const& other) const {
+  RefuseNull(fIsNull);
+  return *this < *other;
 }
 
 }  // namespace NQRVZEP20

@@ -142,14 +142,11 @@ void TCIMDateTimeImpl::Set(unsigned int days, unsigned short hours, unsigned sho
                            unsigned int microSeconds) {
   CheckOrThrow(IsValid(days, hours, minutes, seconds, microSeconds));
   fIsNull = false;
-  fYear = 0;
-  fMonth = 0;
   fDay = days;
   fHour = hours;
   fMinute = minutes;
   fSecond = seconds;
   fMicroSeconds = microSeconds;
-  fUTCOffset = 0;
   fIsInterval = true;
 }
 

@@ -24,12 +24,16 @@ namespace {
 constexpr char const* kKernelTable = "/sys/firmware/dmi/tables/DMI";
 constexpr std::size_t kMaxFileSize = 16u << 20;
 
-using TContents = std::shared_ptr<std::string const>;
+// A file as it was read, and the table in it.
+struct TTableFile {
+  std::string contents;
+  std::string_view table;  // into `contents`
+};
+using TSharedTableFile = std::shared_ptr<TTableFile const>;
 
-// An open handle: the file as it was read, and the place behind the structure handed out last.
+// An open handle, with the place behind the structure handed out last.
 struct THandle {
-  TContents file;
-  std::string_view table;  // into `file`
+  TSharedTableFile file;
   smbios::TStructureReader place;
 };
 
@@ -64,18 +68,18 @@ int StatusOfOpenError(int error) {
 class TLastFile {
 public:
   // Null when that is not the file, or it has changed.
-  TContents Find(struct stat const& status) const {
+  TSharedTableFile Find(struct stat const& status) const {
     const std::lock_guard<std::mutex> lock(fMutex);
-    return fState == StateOf(status) ? fContents : nullptr;
+    return fState == StateOf(status) ? fFile : nullptr;
   }
 
   // Changes within one tick of the clock look alike: a file is kept only once its last change lies back far enough.
-  void Keep(struct stat const& status, TContents contents) {
+  void Keep(struct stat const& status, TSharedTableFile file) {
     constexpr std::time_t kSettledAfterSeconds = 1;
     if (std::time(nullptr) - status.st_ctim.tv_sec <= kSettledAfterSeconds) return;
     const std::lock_guard<std::mutex> lock(fMutex);
     fState = StateOf(status);
-    fContents = std::move(contents);
+    fFile = std::move(file);
   }
 
 private:
@@ -87,7 +91,7 @@ private:
 
   mutable std::mutex fMutex;
   TState fState;
-  TContents fContents;  // null: none yet
+  TSharedTableFile fFile;  // null: none yet
 };
 
 TLastFile& LastFile() {
@@ -109,26 +113,26 @@ bool ReadWhole(int fd, std::size_t size, std::string& contents) {
   return true;
 }
 
-int ReadRegularFile(char const* path, TContents& contents) {
+int ReadTableFile(char const* path, TSharedTableFile& tableFile) {
   struct stat status;
-  if (::stat(path, &status) == 0 && (contents = LastFile().Find(status))) return kSmbiosOk;
+  if (::stat(path, &status) == 0 && (tableFile = LastFile().Find(status))) return kSmbiosOk;
 
   const TOpenFile file(path);
   if (file.Fd() < 0) return StatusOfOpenError(errno);
   if (::fstat(file.Fd(), &status) != 0 || !S_ISREG(status.st_mode)) return kSmbiosFail;
-  const auto whole = std::make_shared<std::string>();
-  if (!ReadWhole(file.Fd(), static_cast<std::size_t>(status.st_size), *whole)) return kSmbiosFail;
-  contents = whole;
-  LastFile().Keep(status, contents);
+  const auto whole = std::make_shared<TTableFile>();
+  if (!ReadWhole(file.Fd(), static_cast<std::size_t>(status.st_size), whole->contents)) return kSmbiosFail;
+  whole->table = smbios::DmiTableIn(whole->contents);
+  tableFile = whole;
+  LastFile().Keep(status, tableFile);
   return kSmbiosOk;
 }
 
 int Load(void** handle) {
   auto loaded = std::make_unique<THandle>();
-  if (const int status = ReadRegularFile(TablePath(), loaded->file); status != kSmbiosOk) return status;
-  loaded->table = smbios::DmiTableIn(*loaded->file);
-  if (loaded->table.empty()) return kSmbiosFail;
-  loaded->place = smbios::TStructureReader(loaded->table);
+  if (const int status = ReadTableFile(TablePath(), loaded->file); status != kSmbiosOk) return status;
+  if (loaded->file->table.empty()) return kSmbiosFail;
+  loaded->place = smbios::TStructureReader(loaded->file->table);
   *handle = loaded.release();
   return kSmbiosOk;
 }
@@ -159,7 +163,7 @@ int smBiosLoad(void* /*provider*/, void** handle) try {
 int smBiosGetFirst(void* handle, int type, void* buffer, int* length) {
   if (handle == nullptr) return kSmbiosFail;
   THandle& opened = *static_cast<THandle*>(handle);
-  return CopyNextOfType(opened, smbios::TStructureReader(opened.table), type, buffer, length);
+  return CopyNextOfType(opened, smbios::TStructureReader(opened.file->table), type, buffer, length);
 }
 
 int smBiosGetNext(void* handle, int type, void* buffer, int* length) {

@@ -7,7 +7,9 @@
 
 #include <gtest/gtest.h>
 
+#include <iostream>
 #include <locale>
+#include <sstream>
 
 namespace NQRVZEP20 {
 namespace {
@@ -67,6 +69,15 @@ TEST(AssertionHandlerTest, TrapPrintsAndReturns) {
   TEnvironmentGuard const mode(kMode, "trap");
   EXPECT_EQ(Printed([] { boost::assertion_failed("px != 0", "f", "a.cpp", 7); }),
             "\nBoost assertion failure! a.cpp:7 [px != 0] func = f\n\nForcing segmentation fault.\n");
+}
+
+TEST(AssertionHandlerTest, PrintsThroughTheStandardErrorStream) {
+  TEnvironmentGuard const mode("ZEP_BOOST_ASSERT", "trap");
+  std::ostringstream printed;
+  std::streambuf* const old = std::cerr.rdbuf(printed.rdbuf());
+  boost::assertion_failed("px != 0", "f()", "file.cpp", 7);
+  std::cerr.rdbuf(old);
+  EXPECT_EQ(printed.str(), "\nBoost assertion failure! file.cpp:7 [px != 0] func = f()\n\nForcing segmentation fault.\n");
 }
 
 TEST(AssertionHandlerTest, ExitPrintsAndEndsTheProcessWith1) {

@@ -85,6 +85,11 @@ TEST(TZEPStatusCodeTest, IsMadeFromAnEnumeratorAndComparesWithOne) {
   static_assert(sizeof(TZEPStatusCode) == 4 && std::is_signed_v<std::underlying_type_t<EZEPStatusCode>>);
 }
 
+TEST(TZEPStatusCodeTest, IsMadeFromANumberAsWell) {
+  EXPECT_EQ(TZEPStatusCode(15), kZEPStatusNotFound);
+  EXPECT_STREQ(TZEPException(15).what(), "kZEPStatusNotFound");
+}
+
 TEST(TZEPStatusCodeTest, TextIsTheSameObjectAtEachCall) {
   EXPECT_EQ(&TZEPStatusCode(kZEPStatusFail).TranslateStatusCode(), &TZEPStatusCode(kZEPStatusFail).TranslateStatusCode());
 }

@@ -65,7 +65,7 @@ TEST(MachineIdentityTest, EveryLengthOfADescriptionIsReadWithoutAnException) {
 }
 
 std::string StringNamedAt(std::string const& structure, std::size_t offset) {
-  return TStructureStrings(structure).NamedAt(offset).value_or("none");
+  return std::string(TStructureStrings(structure).NamedAt(offset).value_or("none"));
 }
 
 TEST(MachineIdentityTest, StringsOfAStructureAreFoundByTheirNumber) {

@@ -91,6 +91,21 @@ TEST_F(TCIMReferenceTest, AKeyHasTheDeclaredType) {
   EXPECT_EQ(KeyOf(disk, "Name"), TCIMValue("5"));
 }
 
+TEST_F(TCIMReferenceTest, NumbersOfOtherTypesAreKeysAsWell) {
+  ns_->Class("X_Disk")->Add("Load", ECIMType::kCIMTypeReal64).Add("Offset", ECIMType::kCIMTypeSint64);
+  EXPECT_EQ(KeysOf(Parsed("ns:X_Disk.Load=\"-0.5\",Offset=\"-9223372036854775808\"")),
+            (TNames{"Load=-0.5", "Offset=-9223372036854775808"}));
+}
+
+TEST_F(TCIMReferenceTest, ACharacterAsAKeyIsSetButNeitherPrintedNorCompared) {
+  ns_->Class("X_Disk")->Add("Letter", ECIMType::kCIMTypeChar16);
+  TCIMReference const disk = Parsed("ns:X_Disk.Letter=\"C\"");
+  EXPECT_EQ(KeyOf(disk, "Letter").GetType(), ECIMType::kCIMTypeChar16);
+  EXPECT_STATUS(disk.GetPath(), kZEPStatusInvalidDateTime);
+  EXPECT_STATUS((void)(disk == Parsed("ns:X_Disk.Letter=\"C\"")), kZEPStatusInvalidDateTime);
+  EXPECT_STATUS((void)(disk < Parsed("ns:X_Disk.Letter=\"C\"")), kZEPStatusInvalidDateTime);
+}
+
 TEST_F(TCIMReferenceTest, WithoutNamespacePrefixAPathWithKeysIsAClassName) {
   TLogCapture log;
   EXPECT_STATUS(Parsed("X_Disk.Id=\"5\""), kZEPStatusInvalidReference);
@@ -424,7 +439,7 @@ TEST_F(TCIMReferenceTest, ParsePathLeavesThePositionOnTheClosingQuoteOfTheEnclos
   TCIMReference disk = Empty();
   std::string const path = "Disk=\"ns:X_Disk.Id=\"5\"\",Port=\"1\"";
   std::size_t pos = 5;
-  TCIMReferenceImpl::ParsePath(*disk.GetBody(), path, pos);
+  TCIMReferenceImpl::ParsePath(disk, path, pos);
   EXPECT_EQ(disk.GetPath(), "X_Disk.Id=\"5\"");
   EXPECT_EQ(path.substr(pos), "\",Port=\"1\"");
 }
@@ -912,6 +927,23 @@ TEST_F(TCIMReferenceTest, ComparingArraysOfKeysThrows) {
   right.AddKeyValue("Bytes", two);
   EXPECT_STATUS((void)(left < right), kZEPStatusNotImplemented);
   EXPECT_FALSE(left == right);
+}
+
+TEST_F(TCIMReferenceTest, ANullKeySortsFirst) {
+  TCIMReference null = Empty();
+  null.SetClassName("X_Disk");
+  null.AddKeyValue("Id", TCIMValue(ECIMType::kCIMTypeUint32, 0));
+  EXPECT_TRUE(null < Disk(0));
+  EXPECT_FALSE(Disk(0) < null);
+  EXPECT_FALSE(null == Disk(0));
+  EXPECT_TRUE(null == TCIMReference(null));
+}
+
+TEST_F(TCIMReferenceTest, ReferencesWithinKeysAreOrderedByTheirOwnKeys) {
+  auto const link = [this](unsigned int id) { return Parsed("ns:X_Link.Disk=\"ns:X_Disk.Id=\"" + std::to_string(id) + "\"\""); };
+  EXPECT_TRUE(link(9) < link(10));
+  EXPECT_FALSE(link(10) < link(9));
+  EXPECT_TRUE(link(9) == link(9));
 }
 
 TEST_F(TCIMReferenceTest, ReferencesAreKeysOfOrderedContainers) {

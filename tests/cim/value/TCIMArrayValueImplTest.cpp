@@ -3,6 +3,8 @@
 #include "TCIMReference.h"
 #include "tests/Support.h"
 
+#include <algorithm>
+
 namespace NQRVZEP20 {
 namespace {
 
@@ -50,7 +52,21 @@ TEST(TCIMArrayValueImplTest, AnArrayInAnArrayPrintsItsOwnBraces) {
             "{ { 1 }, {  } }");
 }
 
+TEST(TCIMArrayValueImplTest, ElementsOfEveryKindPrintAsTheyDoAlone) {
+  TCIMDateTime const day(std::string("00000001000000.000000:000"));
+  EXPECT_EQ(TImpl(TElements{TCIMValue(day), TCIMValue(day)}).ToString(10),
+            "{ 00000001000000.000000:000, 00000001000000.000000:000 }");
+  EXPECT_EQ(TImpl(TElements{TCIMValue(true), TCIMValue(false)}).ToString(16), "{ true, false }");
+  EXPECT_EQ(TImpl(TElements{TCIMValue(true)}).ToString(8), "{ true }");
+  TCIMValue const most(~0ul);
+  EXPECT_EQ(TImpl(TElements{most, most}).ToString(8), "{ 1777777777777777777777, 1777777777777777777777 }");
+  EXPECT_EQ(TImpl(TElements{most, most}).ToString(16), "{ FFFFFFFFFFFFFFFF, FFFFFFFFFFFFFFFF }");
+}
+
 TEST(TCIMArrayValueImplTest, PrintingThrowsWhatAnElementThrows) {
+  EXPECT_STATUS(TImpl(TElements{Uint8(1), NullOf(TType::kCIMTypeUint8)}).ToString(10), kZEPStatusValueIsNULL);
+  EXPECT_STATUS(TImpl(TElements{TCIMValue(0.5), TCIMValue(1.5)}).ToString(8), kZEPStatusNotSupported);
+  EXPECT_STATUS(TImpl(TElements{TCIMValue(true)}).ToString(7), kZEPStatusNotSupported);
   EXPECT_STATUS(TImpl(TElements{TCIMValue("a"), NullOf(TType::kCIMTypeString)}).ToString(10), kZEPStatusValueIsNULL);
   EXPECT_STATUS(TImpl(TElements{TCIMValue(1), TCIMValue(2)}).ToString(16), kZEPStatusNotSupported);
   EXPECT_STATUS(TImpl(TElements{Uint8(1)}).ToString(2), kZEPStatusNotSupported);
@@ -148,6 +164,11 @@ TEST(TCIMArrayValueImplTest, ArrayLessThanThrows) {
   EXPECT_TRUE(one <= TCIMValue(one));  // == is asked first
   EXPECT_FALSE(one > TCIMValue(one));
   EXPECT_TRUE(one < ArrayOf(TType::kCIMTypeSint8, {}));  // by tag
+}
+
+TEST(TCIMArrayValueImplTest, SortingArraysThrows) {
+  TElements arrays{ArrayOf(TType::kCIMTypeUint8, {Uint8(2)}), ArrayOf(TType::kCIMTypeUint8, {Uint8(1)})};
+  EXPECT_STATUS(std::sort(arrays.begin(), arrays.end()), kZEPStatusNotImplemented);
 }
 
 TEST(TCIMArrayValueImplTest, EditingTheVectorChangesWhatTheHandlePrintsNext) {

@@ -79,6 +79,15 @@ TEST(TCIMChar16ImplTest, AnEmptyPointerIsAFailedAssertion) {
   EXPECT_STATUS((void)(TCIMChar16Impl(std::string("A")) == empty), kZEPStatusInvalidDateTime);  // asks for itself first
 }
 
+TEST(TCIMChar16ImplTest, ComparesWithABodyAsWithAPointerToIt) {
+  TCIMChar16Impl const a(65), b(66), null(std::string("a"));
+  EXPECT_TRUE(a == b);
+  EXPECT_TRUE(a < b);
+  EXPECT_TRUE(b < a);
+  EXPECT_STATUS((void)(a == null), kZEPStatusInvalidDateTime);
+  EXPECT_STATUS((void)(null < a), kZEPStatusInvalidDateTime);
+}
+
 TEST(TCIMChar16ImplTest, ComparesWithoutLookingAtTheCodes) {
   auto const other = boost::make_shared<TCIMChar16Impl>((unsigned short)66);
   EXPECT_TRUE(TCIMChar16Impl(65) == other);

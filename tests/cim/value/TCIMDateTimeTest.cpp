@@ -686,6 +686,26 @@ TEST_F(TCIMDateTimeTest, TimestampBehindItsIntervalLosesTheSignOfTheSecondsOnly)
   for (TArithmeticRow const& row : rows) ExpectResult(row);
 }
 
+TEST_F(TCIMDateTimeTest, TheEpochsDateCountsAsTheEpochWhereMktimeGivesMinusOne) {
+  TArithmeticRow const rows[] = {
+      {kEastHour, "19700101005959.000000+000", '+', "00000000000010.000000:000", "19700101010010.000000+000"},
+      {kEastHour, "00000000000010.000000:000", '+', "19700101005959.000000+000", "19700101010010.000000+000"},
+      {kEastHour, "19700101005958.000000+000", '+', "00000000000012.000000:000", "19700101010010.000000+000"},
+      {kEastHour, "19700101005959.000000+000", '-', "00000000000010.000000:000", "19700101010010.000000+000"},
+      {kEastHour, "00000000000010.000000:000", '-', "19700101005959.000000+000", "19700101010010.000000+000"},
+  };
+  for (TArithmeticRow const& row : rows) ExpectResult(row);
+}
+
+TEST_F(TCIMDateTimeTest, AnIntervalLeavesTheFieldsOfATimestampAsTheyWere) {
+  TCIMDateTime value = At("20070315143000.000000+060");
+  value.Set(1, 2, 3, 4, 5);
+  EXPECT_EQ(value.ToString(), "00000001020304.000005:000");
+  EXPECT_EQ(value.GetYear(), 2007);
+  EXPECT_EQ(value.GetMonth(), 3);
+  EXPECT_EQ(value.GetUTCOffset(), 60);
+}
+
 TEST_F(TCIMDateTimeTest, SumBeforeTheEpochComesOutAsFarBehindIt) {
   ExpectResult({kUTC, "19691231000000.000000+000", '+', "00000000010000.000000:000", "19700101230000.000000+000"});
 }

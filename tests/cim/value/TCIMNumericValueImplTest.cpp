@@ -52,6 +52,7 @@ TYPED_TEST(TCIMNumericConversionTest, IsReadOnlyAsExactlyTheTypeItIsStoredAs) {
     EXPECT_STATUS(data.operator std::string(), kZEPStatusTypeMismatch);
     EXPECT_STATUS(data.operator TCIMChar16(), kZEPStatusTypeMismatch);
     EXPECT_STATUS(data.operator TCIMDateTime(), kZEPStatusTypeMismatch);
+    EXPECT_STATUS(data.operator TCIMReference(), kZEPStatusTypeMismatch);
     EXPECT_STATUS(data.operator std::vector<TCIMValue>&(), kZEPStatusTypeMismatch);
   }
 }

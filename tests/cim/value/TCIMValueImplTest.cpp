@@ -37,14 +37,6 @@ TEST(TCIMValueImplTest, TheBaseRefusesEveryConversion) {
   EXPECT_STATUS(data.operator std::vector<TCIMValue>&(), kZEPStatusTypeMismatch);
 }
 
-// The place of a virtual operation in the virtual table, counted from 1: what a pointer to it holds on this platform.
-template <class TMember>
-std::size_t SlotOf(TMember member) {
-  std::uintptr_t offset = 0;
-  std::memcpy(&offset, &member, sizeof offset);
-  return (offset - 1) / sizeof(void*) + 1;
-}
-
 // Plug-ins are compiled against this order. The two destructors are 1 and 2.
 TEST(TCIMValueImplTest, VirtualOperationsKeepTheirSlots) {
   EXPECT_EQ(SlotOf(&TCIMValueImpl::operator bool), 3u);
