@@ -15,6 +15,8 @@
 #include "TZEPException.h"
 #include "core/Log.h"
 
+#include <boost/ref.hpp>
+
 #include <vector>
 
 using namespace NQRVZEP20;
@@ -32,6 +34,13 @@ boost::shared_ptr<ICIMNamespace> Lock(boost::weak_ptr<ICIMNamespace> const& dest
   } catch (boost::bad_weak_ptr const&) {
     return boost::shared_ptr<ICIMNamespace>();
   }
+}
+
+// The callback is handed over by reference: it is too large to be held in one without an allocation.
+void CopyQualifiers(ICIMNamedElement const& from, boost::weak_ptr<ICIMNamespace> const& destination,
+                    boost::shared_ptr<ICIMNamedElement> const& to) {
+  TCopyQualifier copyQualifier(destination, to);
+  from.EnumerateQualifiers(boost::ref(copyQualifier), TCIMContext());
 }
 
 // A declaration without a default may leave the type to be told by the declaration itself.
@@ -126,7 +135,7 @@ void TCopyPropertyDecl::Copy(ICIMPropertyDecl const& declaration) {
 
   const TCIMValue defaultValue = TCIMCopy::CopyValue(declaration.GetDefaultValue(none), Lock(fDestination));
   const boost::shared_ptr<ICIMPropertyDecl> copy = fTarget->AddPropertyDecl(name, defaultValue, none);
-  declaration.EnumerateQualifiers(TCopyQualifier(fDestination, copy), none);
+  CopyQualifiers(declaration, fDestination, copy);
 }
 
 TCopyStaticProperty::TCopyStaticProperty(boost::weak_ptr<ICIMNamespace> destination, boost::shared_ptr<ICIMClass> target)
@@ -146,8 +155,9 @@ bool TCopyMethodDecl::operator()(boost::shared_ptr<ICIMMethodDecl> declaration) 
   const TCIMContext none;
   const boost::shared_ptr<ICIMMethodDecl> copy =
       fTarget->AddMethodDecl(declaration->GetName(none), declaration->GetReturnType(none), none);
-  declaration->EnumerateQualifiers(TCopyQualifier(fDestination, copy), none);
-  declaration->EnumerateParameterDecls(TCopyParameterDecl(fDestination, copy), none);
+  CopyQualifiers(*declaration, fDestination, copy);
+  TCopyParameterDecl copyParameter(fDestination, copy);
+  declaration->EnumerateParameterDecls(boost::ref(copyParameter), none);
   return true;
 }
 
@@ -159,7 +169,7 @@ bool TCopyParameterDecl::operator()(boost::shared_ptr<ICIMParameterDecl> declara
   const boost::shared_ptr<ICIMParameterDecl> copy =
       fTarget->AddParameterDecl(declaration->GetName(none), declaration->GetType(none), declaration->GetMaxArraySize(none),
                                 declaration->GetReferencedClassName(none), none);
-  declaration->EnumerateQualifiers(TCopyQualifier(fDestination, copy), none);
+  CopyQualifiers(*declaration, fDestination, copy);
   return true;
 }
 
