@@ -225,6 +225,43 @@ TEST_F(MofTest, WhatTheFileDoesNotDeclareIsAnError) {
   EXPECT_EQ(run.errors, "zep: disks.mof has no object \"X_Tape\"\n");
 }
 
+// ---- The documentation ----
+
+// The blocks of docs/schemas.md that begin with "$ zep", each with its first line.
+std::vector<std::string> ConsoleBlocks() {
+  std::vector<std::string> blocks;
+  std::string const page = ReadFile(ZEP_SOURCE_DIR "/docs/schemas.md");
+  std::string const fence = "```console\n";
+  for (std::size_t at = page.find(fence); at != page.npos; at = page.find(fence, at + 1)) {
+    std::size_t const start = at + fence.size();
+    blocks.push_back(page.substr(start, page.find("```", start) - start));
+  }
+  return blocks;
+}
+
+TEST_F(MofTest, ThePageOnSchemasShowsWhatIsPrinted) {
+  auto const blocks = ConsoleBlocks();
+  ASSERT_EQ(blocks.size(), 2u);
+  TCall call;
+  call.arguments = {"mof", "examples/Disks/disks.mof"};
+  call.directory = ZEP_SOURCE_DIR;
+  EXPECT_EQ(blocks[0], "$ zep mof examples/Disks/disks.mof\n" + zep_.Run(call).output);
+
+  zep_.Add("libDisks.nsp.so", DISKS_PLUGIN);
+  zep_.Add("disks.mof", ZEP_SOURCE_DIR "/examples/Disks/disks.mof");
+  EXPECT_EQ(blocks[1], "$ zep show 'X_Disk.Name=\"sda\"'\n" + Run({"show", "X_Disk.Name=\"sda\""}).output);
+}
+
+TEST_F(MofTest, AProviderWhoseSchemaIsWrongIsReportedWithThePlace) {
+  zep_.Add("libDisks.nsp.so", DISKS_PLUGIN);
+  WriteFile(zep_.Path("lib/disks.mof"), "class X_Disk {");
+  TRun const run = Run({"classes"});
+  EXPECT_EQ(run.status, 2);
+  EXPECT_THAT(run.errors, testing::StartsWith("zep: Disks: "));
+  EXPECT_THAT(run.errors,
+              testing::EndsWith("/disks.mof:1:15: expected a type, a class and \"REF\", or \"}\", found the end of the file\n"));
+}
+
 // ---- The real schema ----
 
 TEST_F(MofTest, TheRealSchemaIsCountedAndShown) {
