@@ -12,12 +12,6 @@ std::atomic<long> gAllocations = 0;
 
 }  // namespace
 
-#if defined(__has_feature)
-#if __has_feature(thread_sanitizer)
-#define ZEP_THREAD_SANITIZER
-#endif
-#endif
-
 #ifdef ZEP_THREAD_SANITIZER
 
 bool NQRVZEP20::CountsAllocations() { return false; }

@@ -134,7 +134,9 @@ std::vector<TOperation> Operations() {
       {"FindFile",
        {"tree/below/file", spawnFind},
        SpawnFaults({spawnFind}, "tree/below/file", "tree/below/file", "", "") +
-           std::vector<TFault>{{"child.execvp", "1", ENOENT, {"", spawnFind}}}},
+           std::vector<TFault>{
+               {"child.execvp", "1", ENOENT, {"", spawnFind}},
+               {"select", "1", 0, {"", spawnFind, "[Debug] ERROR: SpawnProcess - find TimeOut!", "a child left"}}}},
       {"CapFileViaProc",
        {"0123456789", spawn, returned},
        {{"pipe", "1", EMFILE, {"0123456789", spawn, "[Debug] ERROR: SpawnProcess - pipe call failed!", returned}},
@@ -144,6 +146,10 @@ std::vector<TOperation> Operations() {
          "1",
          EINTR,
          {"0123456789", spawn, "[Debug] ERROR: SpawnProcess - select call failed!", returned, "a child left"}},
+        {"select",
+         "1",
+         0,
+         {"0123456789", spawn, "[Debug] ERROR: SpawnProcess - " + kChild + " TimeOut!", returned, "a child left"}},
         {"waitpid",
          "1",
          ECHILD,

@@ -202,6 +202,13 @@ protected:
     fPath.emplace("PATH", (fDir.Path("bin") + ":/usr/bin:/bin").c_str());
   }
 
+  // Commands that only write down their arguments: nothing is to be copied to the root.
+  void RecordCommandsOnly() {
+    for (char const* command : {"cp", "vi"}) {
+      WriteFile(fDir.Path("bin/") + command, std::string("#!/bin/sh\nset -f\necho ") + command + " \"$@\" >> " + Record() + "\n");
+      fs::permissions(fDir.Path("bin/") + command, fs::perms::all);
+    }
+  }
   std::string Record() const { return fDir.Path("record"); }
   std::string Edited() const { return ReadFile(Record()); }
 
@@ -240,11 +247,7 @@ TEST_F(LaunchTextEditorTest, AShorterPathThrowsAfterTheCopy) {
 }
 
 TEST_F(LaunchTextEditorTest, WithoutAWorkingDirectoryTheCopyGoesToTheRoot) {
-  // With commands of our own, which write down their arguments: nothing is to be copied to the root.
-  for (char const* command : {"cp", "vi"}) {
-    WriteFile(fDir.Path("bin/") + command, std::string("#!/bin/sh\nset -f\necho ") + command + " \"$@\" >> " + Record() + "\n");
-    fs::permissions(fDir.Path("bin/") + command, fs::perms::all);
-  }
+  RecordCommandsOnly();
   std::string const path = "/" + std::string(40, 'y');
   EXPECT_EQ(InChild([&] {
               fs::create_directory(fDir.Path("gone"));
@@ -254,6 +257,27 @@ TEST_F(LaunchTextEditorTest, WithoutAWorkingDirectoryTheCopyGoesToTheRoot) {
               return Edited();
             }),
             "cp " + path + " /\nvi /*" + std::string(35, 'y') + "*\n");
+}
+
+TEST_F(LaunchTextEditorTest, AWorkingDirectoryOfUpTo4095BytesWillDo) {
+  RecordCommandsOnly();
+  std::string const path = "/" + std::string(40, 'y');
+  auto const editIn = [&](std::size_t length) {
+    return InChild([&] {
+      fs::create_directory(fDir.Path(std::to_string(length)));
+      fs::current_path(fDir.Path(std::to_string(length)));
+      GoDownTo(length);
+      TOSSpecific::LaunchTextEditor(path);
+      std::string const edited = Edited();
+      fs::remove(Record());
+      return std::to_string(edited.size()) + edited.substr(edited.find("vi "));
+    });
+  };
+  std::string const name = "*" + std::string(35, 'y') + "*\n";
+  std::size_t const withoutDirectory = ("cp " + path + " \nvi " + name).size();
+  EXPECT_EQ(editIn(1100), std::to_string(withoutDirectory + 1100) + "vi " + name);
+  EXPECT_EQ(editIn(4095), std::to_string(withoutDirectory + 4095) + "vi " + name);
+  EXPECT_EQ(editIn(4096), std::to_string(withoutDirectory + 2) + "vi /" + name);
 }
 
 }  // namespace

@@ -470,6 +470,15 @@ TEST_F(FilesTest, CreatedFileIsForItsOwnerToWrite) {
 }
 
 TEST_F(FilesTest, CreateFileThatCannotBeOpenedIsFalseWithTheReasonAtDebug) {
+  WriteFile(fDir.Path("write-only"), "old");  // it is opened for reading as well
+  fs::permissions(fDir.Path("write-only"), static_cast<fs::perms>(0222));
+  EXPECT_EQ(InChild([&] {
+              if (!BecomeUnprivileged()) return std::string("still root");
+              return std::string(TOSSpecific::createFile(fDir.Path("write-only"), "new") ? "created" : "not created");
+            }),
+            "not created");
+  EXPECT_EQ(ReadFile(fDir.Path("write-only")), "old");
+
   std::string const path = fDir.Path("missing/file");
   EXPECT_EQ(LogOf([&] { EXPECT_FALSE(TOSSpecific::createFile(path, "text")); }),
             (TEntries{"[Debug] Entering TOSSpecific::createFile, path=" + path, "[Debug] Unable to create file, errno=2"}));

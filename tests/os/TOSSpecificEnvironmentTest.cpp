@@ -24,17 +24,6 @@ TEST(GetCurrentDirTest, IsTheWorkingDirectory) {
             "/");
 }
 
-// Goes down into directories of 100 characters each, and then into one that makes the path as long as asked.
-void GoDownTo(std::size_t length) {
-  std::size_t now = fs::current_path().string().size();
-  while (now < length) {
-    std::size_t const step = length - now > 202 ? 100 : length - now > 102 ? 50 : length - now - 1;
-    std::string const name(step, 'd');
-    if (::mkdir(name.c_str(), 0777) != 0 || ::chdir(name.c_str()) != 0) throw std::runtime_error("cannot go down");
-    now += step + 1;
-  }
-}
-
 TEST(GetCurrentDirTest, APathOf1023BytesIsTheLongest) {
   TTempDir const dir;
   auto const currentDirOfLength = [&](std::size_t length) {

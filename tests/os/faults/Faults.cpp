@@ -1,6 +1,7 @@
 // To be preloaded: makes one call of a named function of the C library fail. ZEP_FAULT says which, as FUNCTION:NUMBER:ERRNO,
 // the number counting the calls of that function from 1; "child." before the function means those of a child before its
-// exec. For write, the errors 0 and -1 stand for a write of nothing and of the first half.
+// exec. For write, the errors 0 and -1 stand for a write of nothing and of the first half; for select, the
+// error 0 stands for a time-out that was of 300 seconds.
 //
 // Calls count from ArmFaults to DisarmFaults only, so that a program can prepare itself first. CallsOfFaults tells how
 // often each function was called in between.
@@ -98,8 +99,6 @@ FAILING(char*, getcwd, (char* buffer, size_t length), (buffer, length), nullptr)
 FAILING(int, setenv, (char const* name, char const* value, int overwrite), (name, value, overwrite), -1)
 FAILING(int, pipe, (int ends[2]), (ends), -1)
 FAILING(int, dup2, (int from, int to), (from, to), -1)
-FAILING(int, select, (int count, fd_set* in, fd_set* out, fd_set* special, struct timeval* limit),
-        (count, in, out, special, limit), -1)
 FAILING(pid_t, waitpid, (pid_t child, int* status, int options), (child, status, options), -1)
 FAILING(int, sigaction, (int number, struct sigaction const* action, struct sigaction* old), (number, action, old), -1)
 FAILING(int, execve, (char const* path, char* const arguments[], char* const environment[]), (path, arguments, environment), -1)
@@ -120,6 +119,14 @@ EXPORT int open(char const* path, int flags, ...) {
   if (!IsTheOne("open")) return next(path, flags, mode);
   errno = gError;
   return -1;
+}
+
+EXPORT int select(int count, fd_set* in, fd_set* out, fd_set* special, struct timeval* limit) {
+  static auto* const next = Next("select", &select);
+  if (!IsTheOne("select")) return next(count, in, out, special, limit);
+  errno = gError;
+  bool const isOf300Seconds = limit != nullptr && limit->tv_sec == 300 && limit->tv_usec == 0;
+  return gError == 0 && isOf300Seconds ? 0 : -1;
 }
 
 EXPORT int close(int fd) {

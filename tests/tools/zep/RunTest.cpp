@@ -32,6 +32,16 @@ TEST_F(RunTest, OptionsBehindTheCommandAreTheCommands) {
   EXPECT_EQ(run.output, "--timeout 1 --help -x\n");
 }
 
+TEST_F(RunTest, AZeroByteCutsOffTheRestOfItsChunk) {
+  EXPECT_EQ(Run({"sh", "-c", "printf 'seen\\0lost'; sleep 0.2; echo +"}).output, "seen+\n");
+}
+
+TEST_F(RunTest, ATimeoutOfZeroAllowsNoSilence) {
+  TRun const run = Run({"--timeout", "0", "sh", "-c", "sleep 1"});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, "");
+}
+
 TEST_F(RunTest, TellsThatACommandFailed) {
   std::string const reason = " could not be executed, did not exit with 0 or was ended by a signal\n";
   for (std::vector<std::string> const& command :
