@@ -19,26 +19,28 @@ namespace {
 
 using TType = TCIMValue::TCIMType;
 
-// Tells the class that it is being described, for as long as this lives.
-class TDeclaring {
-public:
-  explicit TDeclaring(ICIMClass& cls) : fClass(cls) { fClass.BeginDeclarations(TCIMContext()); }
-  ~TDeclaring() {
-    try {
-      fClass.EndDeclarations(TCIMContext());
-    } catch (...) {  // nobody could be told
-    }
-  }
-  TDeclaring(TDeclaring const&) = delete;
-  TDeclaring& operator=(TDeclaring const&) = delete;
-
-private:
-  ICIMClass& fClass;
-};
-
 boost::shared_ptr<ICIMClass> SuperClassIn(ICIMNamespace const& dst, ICIMClass const& cls) {
   if (cls.IsRootClass(TCIMContext())) return boost::shared_ptr<ICIMClass>();
   return dst.GetClass(cls.GetSuperClass(TCIMContext())->GetName(TCIMContext()), TCIMContext());
+}
+
+void EndDeclarationsQuietly(ICIMClass& cls) noexcept {
+  try {
+    cls.EndDeclarations(TCIMContext());
+  } catch (...) {  // another exception is on its way
+  }
+}
+
+// The class is told that it is being described, also of the end when that comes by an exception.
+void CopyPropertyDecls(ICIMClass const& cls, boost::shared_ptr<ICIMClass> copy, boost::shared_ptr<ICIMNamespace> dst) {
+  copy->BeginDeclarations(TCIMContext());
+  try {
+    cls.EnumeratePropertyDecls(TCopyPropertyDecl(dst, copy), TCIMContext());
+  } catch (...) {
+    EndDeclarationsQuietly(*copy);
+    throw;
+  }
+  copy->EndDeclarations(TCIMContext());
 }
 
 // The class of the same name; empty when the value refers to none.
@@ -82,10 +84,7 @@ void TCIMCopy::CopyClass(boost::shared_ptr<ICIMClass> cls, boost::shared_ptr<ICI
   const boost::shared_ptr<ICIMClass> superClass = SuperClassIn(*dst, *cls);
   const boost::shared_ptr<ICIMClass> copy = dst->CreateClass(superClass, cls->GetName(TCIMContext()), TCIMContext());
   cls->EnumerateQualifiers(TCopyQualifier(dst, copy), TCIMContext());
-  {
-    const TDeclaring declaring(*copy);
-    cls->EnumeratePropertyDecls(TCopyPropertyDecl(dst, copy), TCIMContext());
-  }
+  CopyPropertyDecls(*cls, copy, dst);
   cls->EnumerateStaticProperties(TCopyStaticProperty(dst, copy), TCIMContext());
   cls->EnumerateMethodDecls(TCopyMethodDecl(dst, copy), TCIMContext());
 }

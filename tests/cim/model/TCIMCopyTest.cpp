@@ -134,9 +134,10 @@ TEST_F(TCIMCopyTest, NothingButTheDeclarationsOfPropertiesSwallowsAnException) {
   for (std::string const call :
        {"CreateQualifierDecl dst:Key", "EnumerateClasses src:", "GetClassFlag src:X_B", "CreateClass dst:X_B under X_A",
         "GetClass dst:X_A", "GetQualifierDecl dst:Description", "AddQualifier dst:X_B Description", "BeginDeclarations dst:X_B",
-        "SetStaticProperty dst:X_B.Count", "AddMethodDecl dst:X_B.Reset", "AddQualifier dst:X_B.Reset Description",
-        "AddParameterDecl dst:X_B.Reset.Force", "AddQualifier dst:X_B.Reset.Force In", "GetQualifier src:X_B PLUGINNAME",
-        "IsAbstract src:X_B", "EnumerateSubClasses src:X_A"}) {
+        "EndDeclarations dst:X_B", "EnumeratePropertyDecls src:X_B", "SetStaticProperty dst:X_B.Count",
+        "AddMethodDecl dst:X_B.Reset", "AddQualifier dst:X_B.Reset Description", "AddParameterDecl dst:X_B.Reset.Force",
+        "AddQualifier dst:X_B.Reset.Force In", "GetQualifier src:X_B PLUGINNAME", "IsAbstract src:X_B",
+        "EnumerateSubClasses src:X_A"}) {
     SCOPED_TRACE(call);
     TTrace trace;
     trace.fOnCall[call] = [] { throw TZEPException(kZEPStatusCorruptedContainer); };
@@ -177,24 +178,24 @@ TEST_F(TCIMCopyTest, AClassIsCopiedInTheOrderOfItsParts) {
   const auto copy = NewNamespace();
   copy->DefineClass("X_A");
   TCIMCopy::CopyClass(Traced(source_, "src")->GetClass("X_B", kNone), Traced(copy, "dst"));
-  EXPECT_THAT(
-      trace_.fCalls,
-      ElementsAre("GetClass src:X_B", "GetClass dst:X_A", "CreateClass dst:X_B under X_A", "EnumerateQualifiers src:X_B",
-                  "GetQualifierDecl dst:Description", "AddQualifier dst:X_B Description",
+  EXPECT_THAT(trace_.fCalls,
+              ElementsAre("GetClass src:X_B", "GetClass dst:X_A", "CreateClass dst:X_B under X_A", "EnumerateQualifiers src:X_B",
+                          "GetQualifierDecl dst:Description", "AddQualifier dst:X_B Description",
 
-                  "BeginDeclarations dst:X_B", "EnumeratePropertyDecls src:X_B", "GetPropertyDecl dst:X_B.Name",
-                  "GetQualifier src:X_B.Name OVERRIDE", "GetDefaultValue src:X_B.Name", "AddPropertyDecl dst:X_B.Name",
-                  "EnumerateQualifiers src:X_B.Name", "GetQualifierDecl dst:Override", "AddQualifier dst:X_B.Name Override",
-                  "GetPropertyDecl dst:X_B.Count", "GetQualifier src:X_B.Count OVERRIDE", "GetDefaultValue src:X_B.Count",
-                  "AddPropertyDecl dst:X_B.Count", "EnumerateQualifiers src:X_B.Count", "GetQualifierDecl dst:Static",
-                  "AddQualifier dst:X_B.Count Static", "EndDeclarations dst:X_B",
+                          "BeginDeclarations dst:X_B", "EndDeclarations dst:X_B", "EnumeratePropertyDecls src:X_B",
+                          "EnumeratePropertyDecls src:X_B", "GetPropertyDecl dst:X_B.Name", "GetQualifier src:X_B.Name OVERRIDE",
+                          "GetDefaultValue src:X_B.Name", "AddPropertyDecl dst:X_B.Name", "EnumerateQualifiers src:X_B.Name",
+                          "GetQualifierDecl dst:Override", "AddQualifier dst:X_B.Name Override", "GetPropertyDecl dst:X_B.Count",
+                          "GetQualifier src:X_B.Count OVERRIDE", "GetDefaultValue src:X_B.Count", "AddPropertyDecl dst:X_B.Count",
+                          "EnumerateQualifiers src:X_B.Count", "GetQualifierDecl dst:Static", "AddQualifier dst:X_B.Count Static",
+                          "EndDeclarations dst:X_B",
 
-                  "EnumerateStaticProperties src:X_B", "SetStaticProperty dst:X_B.Count",
+                          "EnumerateStaticProperties src:X_B", "SetStaticProperty dst:X_B.Count",
 
-                  "EnumerateMethodDecls src:X_B", "AddMethodDecl dst:X_B.Reset", "EnumerateQualifiers src:X_B.Reset",
-                  "GetQualifierDecl dst:Description", "AddQualifier dst:X_B.Reset Description",
-                  "EnumerateParameterDecls src:X_B.Reset", "AddParameterDecl dst:X_B.Reset.Force", "GetQualifierDecl dst:In",
-                  "AddQualifier dst:X_B.Reset.Force In"));
+                          "EnumerateMethodDecls src:X_B", "AddMethodDecl dst:X_B.Reset", "EnumerateQualifiers src:X_B.Reset",
+                          "GetQualifierDecl dst:Description", "AddQualifier dst:X_B.Reset Description",
+                          "EnumerateParameterDecls src:X_B.Reset", "AddParameterDecl dst:X_B.Reset.Force",
+                          "GetQualifierDecl dst:In", "AddQualifier dst:X_B.Reset.Force In"));
 }
 
 TEST_F(TCIMCopyTest, ASuperclassThatIsMissingEndsTheCopyOfAClass) {
@@ -377,6 +378,27 @@ TEST_F(TCIMCopyTest, AStepGoesOnWithoutItsNamespace) {
   EXPECT_STATUS((TCopyClass{gone, false, false}(cls)), kZEPStatusFail);
   EXPECT_STATUS((TCopyClassTree{gone, false, false}(cls)), kZEPStatusFail);
   EXPECT_TRUE((TCopyClassTree{gone, true, false}(cls)));  // of the other pass: nothing is written
+}
+
+TEST_F(TCIMCopyTest, StepsThatNeedNoNamespaceAreDoneWithoutOne) {
+  const auto cls =
+      source_->DefineClass("X_A").Static("Count", "uint16", 1).Property("Name", "string").Method("Reset", "uint32").Class();
+  const auto target = copy_->DefineClass("X_A").Property("Count", "uint16").Property("Name", "string").Class();
+  cls->AddMethodDecl("Stop", TType::kCIMTypeUint32, kNone)->AddParameterDecl("Force", TType::kCIMTypeBoolean, 0, "", kNone);
+  const auto instance = source_->AddInstance("X_A", {{"Name", "a"}});
+  const auto copiedInstance = target->CreateInstance(kNone);
+  const boost::weak_ptr<ICIMNamespace> gone;
+
+  cls->EnumerateStaticProperties(TCopyStaticProperty(gone, target), kNone);
+  cls->EnumerateMethodDecls(TCopyMethodDecl(gone, target), kNone);
+  instance->EnumerateProperties(TCopyInstanceProperty(gone, copiedInstance), kNone);
+
+  EXPECT_THAT(Names(*target, &ICIMClass::EnumerateStaticProperties), ElementsAre("Count"));
+  EXPECT_THAT(Names(*target, &ICIMClass::EnumerateMethodDecls), ElementsAre("Reset", "Stop"));
+  EXPECT_EQ(copiedInstance->GetProperty("Name", kNone)->GetValue(kNone).ToString(), "a");
+
+  cls->AddQualifier(source_->GetQualifierDecl("Description", kNone), TCIMValue("a"), 0, kNone);
+  EXPECT_STATUS(cls->EnumerateQualifiers(TCopyQualifier(gone, target), kNone), kZEPStatusFail);
 }
 
 // ---- Instances ----
