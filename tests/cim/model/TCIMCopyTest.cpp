@@ -178,24 +178,24 @@ TEST_F(TCIMCopyTest, AClassIsCopiedInTheOrderOfItsParts) {
   const auto copy = NewNamespace();
   copy->DefineClass("X_A");
   TCIMCopy::CopyClass(Traced(source_, "src")->GetClass("X_B", kNone), Traced(copy, "dst"));
-  EXPECT_THAT(trace_.fCalls,
-              ElementsAre("GetClass src:X_B", "GetClass dst:X_A", "CreateClass dst:X_B under X_A", "EnumerateQualifiers src:X_B",
-                          "GetQualifierDecl dst:Description", "AddQualifier dst:X_B Description",
+  EXPECT_THAT(
+      trace_.fCalls,
+      ElementsAre("GetClass src:X_B", "GetClass dst:X_A", "CreateClass dst:X_B under X_A", "EnumerateQualifiers src:X_B",
+                  "GetQualifierDecl dst:Description", "AddQualifier dst:X_B Description",
 
-                          "BeginDeclarations dst:X_B", "EndDeclarations dst:X_B", "EnumeratePropertyDecls src:X_B",
-                          "EnumeratePropertyDecls src:X_B", "GetPropertyDecl dst:X_B.Name", "GetQualifier src:X_B.Name OVERRIDE",
-                          "GetDefaultValue src:X_B.Name", "AddPropertyDecl dst:X_B.Name", "EnumerateQualifiers src:X_B.Name",
-                          "GetQualifierDecl dst:Override", "AddQualifier dst:X_B.Name Override", "GetPropertyDecl dst:X_B.Count",
-                          "GetQualifier src:X_B.Count OVERRIDE", "GetDefaultValue src:X_B.Count", "AddPropertyDecl dst:X_B.Count",
-                          "EnumerateQualifiers src:X_B.Count", "GetQualifierDecl dst:Static", "AddQualifier dst:X_B.Count Static",
-                          "EndDeclarations dst:X_B",
+                  "BeginDeclarations dst:X_B", "EnumeratePropertyDecls src:X_B", "GetPropertyDecl dst:X_B.Name",
+                  "GetQualifier src:X_B.Name OVERRIDE", "GetDefaultValue src:X_B.Name", "AddPropertyDecl dst:X_B.Name",
+                  "EnumerateQualifiers src:X_B.Name", "GetQualifierDecl dst:Override", "AddQualifier dst:X_B.Name Override",
+                  "GetPropertyDecl dst:X_B.Count", "GetQualifier src:X_B.Count OVERRIDE", "GetDefaultValue src:X_B.Count",
+                  "AddPropertyDecl dst:X_B.Count", "EnumerateQualifiers src:X_B.Count", "GetQualifierDecl dst:Static",
+                  "AddQualifier dst:X_B.Count Static", "EndDeclarations dst:X_B",
 
-                          "EnumerateStaticProperties src:X_B", "SetStaticProperty dst:X_B.Count",
+                  "EnumerateStaticProperties src:X_B", "SetStaticProperty dst:X_B.Count",
 
-                          "EnumerateMethodDecls src:X_B", "AddMethodDecl dst:X_B.Reset", "EnumerateQualifiers src:X_B.Reset",
-                          "GetQualifierDecl dst:Description", "AddQualifier dst:X_B.Reset Description",
-                          "EnumerateParameterDecls src:X_B.Reset", "AddParameterDecl dst:X_B.Reset.Force",
-                          "GetQualifierDecl dst:In", "AddQualifier dst:X_B.Reset.Force In"));
+                  "EnumerateMethodDecls src:X_B", "AddMethodDecl dst:X_B.Reset", "EnumerateQualifiers src:X_B.Reset",
+                  "GetQualifierDecl dst:Description", "AddQualifier dst:X_B.Reset Description",
+                  "EnumerateParameterDecls src:X_B.Reset", "AddParameterDecl dst:X_B.Reset.Force", "GetQualifierDecl dst:In",
+                  "AddQualifier dst:X_B.Reset.Force In"));
 }
 
 TEST_F(TCIMCopyTest, ASuperclassThatIsMissingEndsTheCopyOfAClass) {
