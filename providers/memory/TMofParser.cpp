@@ -62,17 +62,21 @@ void TMofParser::Parse() {
       ParsePragma();
     else if (IsWord("qualifier"))
       ParseQualifierDecl();
-    else if (IsMark('[') || IsWord("class") || IsWord("instance")) {
-      TMofQualifiers qualifiers = ParseQualifiers();
-      if (IsWord("class"))
-        ParseClass(std::move(qualifiers));
-      else if (IsWord("instance"))
-        ParseInstance();
-      else
-        Refuse("\"class\" or \"instance\"");
-    } else
+    else if (IsMark('[') || IsWord("class") || IsWord("instance"))
+      ParseClassOrInstance();
+    else
       Refuse("\"qualifier\", \"class\", \"instance\" or a pragma");
   }
+}
+
+void TMofParser::ParseClassOrInstance() {
+  TMofQualifiers qualifiers = ParseQualifiers();
+  if (IsWord("class"))
+    ParseClass(std::move(qualifiers));
+  else if (IsWord("instance"))
+    ParseInstance();
+  else
+    Refuse("\"class\" or \"instance\"");
 }
 
 // An include is read where it stands; every other pragma is passed over.
@@ -103,7 +107,7 @@ void TMofParser::ParseQualifierDecl() {
   if (Skip(',')) {
     if (!SkipWord("flavor")) Refuse("\"Flavor\"");
     Expect('(');
-    decl.fFlavor = ParseFlavor("\")\"");
+    decl.fFlavor = ParseFlavor(true);
     Expect(')');
   }
   Expect(';');
@@ -125,18 +129,20 @@ unsigned int TMofParser::ParseScope() {
   return scope;
 }
 
-// Words one after another, with or without commas. What they do not say is that of a qualifier without flavor.
-unsigned int TMofParser::ParseFlavor(char const* closing) {
+// Words one after another, in a declaration with commas if it likes. What they do not say is that of a qualifier without
+// flavor.
+unsigned int TMofParser::ParseFlavor(bool inDeclaration) {
   unsigned int flavor = ICIMQualifierDecl::kFlavorDefault;
   for (bool isFirst = true;; isFirst = false) {
     const auto found = std::find_if(std::begin(kFlavors), std::end(kFlavors), [&](auto const& row) { return IsWord(row.fWord); });
     if (found == std::end(kFlavors)) {
-      if (!isFirst && fToken.fKind == TMofToken::kMark) return flavor;
-      Refuse(isFirst ? "a flavor, such as \"ToSubclass\"" : std::string("a flavor or ") + closing);
+      if (isFirst) Refuse("a flavor, such as \"ToSubclass\"");
+      if (fToken.fKind == TMofToken::kMark) return flavor;
+      Refuse(inDeclaration ? "a flavor or \")\"" : "a flavor or \",\" or \"]\"");
     }
     flavor = (flavor | found->fSet) & ~found->fClear;
     Advance();
-    if (*closing == '"' && closing[1] == ')') Skip(',');
+    if (inDeclaration) Skip(',');
   }
 }
 
@@ -195,7 +201,7 @@ TMofQualifier TMofParser::ParseQualifier() {
     qualifier.fValue = ParseValue();
     Expect(')');
   }
-  if (Skip(':')) qualifier.fFlavor = ParseFlavor("\",\" or \"]\"");
+  if (Skip(':')) qualifier.fFlavor = ParseFlavor(false);
   return qualifier;
 }
 
@@ -211,7 +217,8 @@ TMofFeature TMofParser::ParseFeature() {
     Advance();
   } else if (Skip('='))
     feature.fDefault = ParseValue();
-  if (!Skip(';')) Refuse(feature.fIsMethod ? "\";\"" : feature.fDefault ? "\";\"" : "\"(\", \"=\" or \";\"");
+  const bool couldGoOn = !feature.fIsMethod && !feature.fDefault;
+  if (!Skip(';')) Refuse(couldGoOn ? "\"(\", \"=\" or \";\"" : "\";\"");
   return feature;
 }
 

@@ -21,12 +21,13 @@ private:
   // ---- Productions ----
   void ParsePragma();
   void ParseQualifierDecl();
+  void ParseClassOrInstance();
   void ParseClass(TMofQualifiers qualifiers);
   void ParseInstance();
   TMofQualifiers ParseQualifiers();
   TMofQualifier ParseQualifier();
   unsigned int ParseScope();
-  unsigned int ParseFlavor(char const* closing);
+  unsigned int ParseFlavor(bool inDeclaration);
   TMofFeature ParseFeature();
   TMofParameter ParseParameter();
   TMofType ParseType();
