@@ -105,7 +105,10 @@ std::string DescriptionOf(ICIMClass const& cls) {
   auto const qualifier = cls.GetQualifier("Description", TCIMContext());
   TCIMValue const value = qualifier ? qualifier->GetValue(TCIMContext()) : TCIMValue();
   if (value.IsNull()) return "";
-  std::istringstream paragraphs(value.ToString());
+  std::string description = value.ToString();
+  for (char& c : description)
+    if (c == '\t' || c == '\r') c = ' ';
+  std::istringstream paragraphs(description);
   std::string text;
   for (std::string paragraph; std::getline(paragraphs, paragraph);)
     for (std::string const& line : Wrapped(Printable(paragraph), kLineWidth)) text += line + "\n";
