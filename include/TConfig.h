@@ -43,11 +43,11 @@ public:
   // Every key, in ascending byte order.
   std::vector<std::string> listKeys();
 
+  static TConfig* cfgInstance;  // null until its first use
+
 private:
   std::map<std::string, std::string> fSettings;
   std::string fFileName;
-
-  static TConfig* cfgInstance;  // null until its first use
 };
 
 }  // namespace NQRVZEP20

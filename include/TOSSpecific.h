@@ -2,7 +2,11 @@
 
 #include "ILogger.h"
 #include "TCIMDateTime.h"
+#include "TZEPStatusCode.h"
 #include "ZEPExport.h"
+
+#include <boost/shared_ptr.hpp>
+#include <cstdio>
 
 #include <fstream>
 #include <string>
@@ -10,6 +14,7 @@
 
 namespace NQRVZEP20 {
 
+class ICIMNamespace;
 class INamespaceConsumer;
 class TPluginManagerProvider;  // the host's handle for the machine-identification library; only ever handed on
 
@@ -20,6 +25,25 @@ ZEP_EXPORT extern std::string const kNSPExtension;
 // itself asks for neither. Set them once, at start-up.
 ZEP_EXPORT extern bool isLuz;
 ZEP_EXPORT extern bool isParser;  // whether the process runs as the collector's parser
+
+// Where a download goes.
+struct TCurlWriteContext {
+  std::string fPath;   // appended to; empty: nowhere
+  std::FILE* fStream;  // open only while a chunk is written
+};
+
+// libcurl's write callback for downloads: appends `count` items of `size` bytes to the file of the TCurlWriteContext, which
+// it opens for each chunk and closes again, and returns the number of items written; 0 when only closing it shows that the
+// chunk did not get to the disk. 0xFFFFFFFF when there is no context, no path, or the file cannot be opened. Any number but
+// `count` stops libcurl; what was written stays.
+ZEP_EXPORT unsigned long curl_fwrite(void* data, unsigned long size, unsigned long count, void* context);
+
+// One medium that can be taken out of the machine.
+struct TRemovableMedium {
+  std::string fDevice;       // "/dev/sdb"
+  std::string fDescription;  // for people: "Example Virtual Disk"
+  std::string fMountPoint;   // "/mnt/key"; empty when it could not be mounted
+};
 
 // Every service of the operating system that the library uses. Static operations only. Each runs on the caller's thread
 // and blocks it until done; none takes a lock. Failures are thrown as TZEPException unless an operation says otherwise.
@@ -268,6 +292,98 @@ public:
   // it and was cleared by the caller: for number 1 without, for later ones with its zero byte. 1 when found, 0 otherwise.
   // The empty string that closes the set is none of its strings. Reads no byte behind `length`.
   static int getBIDString(char* stringSet, char* output, int length, int number);
+
+  // The identity of a remote server, read from the FRU data of its management controller over IPMI on the LAN (port 623)
+  // through the platform library libipmiClient.so. Each call opens a session of its own, in place of the one that was
+  // open, and leaves it open. Empty when no session could be opened, "N/A" when the controller could not be asked. Not
+  // from two threads at once.
+  static std::string GetRemoteMSN(std::string host, std::string user, std::string password);  // serial number, 7 characters
+  static std::string GetRemoteMT(std::string host, std::string user, std::string password);   // machine type, 4 characters
+  static std::string GetRemoteMachineModel(std::string host, std::string user, std::string password);
+
+  // Marks the start of a debug session: makes or truncates the file "<path><machine type><local time>.log", such as
+  // "/tmp/zep_123420240303-090507.log", where a null `path` stands for "/var/log/QRV_Support/zep_" (in the OEM variant
+  // "/var/log/OEM_Support/zep_"). The whole path is cut off after 255 bytes. Nothing is written to the file, and a failure
+  // to make it goes unnoticed. Then sets the logger's threshold to a `level` of 0 to 4 and returns true; any other level
+  // changes nothing and returns false.
+  static bool SetDebugLevel(int level, char* path);
+
+  // ---- File transfer (TOSSpecificTransfer.cpp) ----
+  //
+  // By libcurl, which each call loads afresh and unloads again: the file libcurl.so or libcurl.so.4 beside the core library,
+  // else by the loader's search libcurl.so, .4, .3 or .2. No call while another one runs: libcurl's global state is one.
+  //
+  // URLs are used as they are: blanks and the like are to be written as "%20". A user and a password stand in the URL.
+  // FTP uses plain passive mode (PASV); no proxy is used, none from the environment either. There is no time-out: a server
+  // that stops in the middle keeps the caller waiting.
+
+  // Uploads the file to the URL, making missing directories there, or downloads the URL into the file.
+  //
+  // When a download finds the local file, it asks on standard output whether to overwrite it, until standard input says "y"
+  // or "n" in either case. For "n" (and at the end of the input), and for "y" when the file cannot be deleted, it returns
+  // without a transfer and without an error. An empty download leaves no file. What arrived of a broken one stays.
+  //
+  // Every failure is logged as an error. Throws kZEPStatusLibCurlFailure when libcurl cannot be had or set up, or the file to
+  // be uploaded cannot be read; kZEPStatusConnectionFailed when the host is unknown or nobody answers there;
+  // kZEPStatusAccessDenied for any other failure of the transfer, a full local disk included.
+  static void CurlTransferFile(std::string url, std::string localFile, bool download);
+
+  // Uploads to ftp://host/name or sftp://host/name; when the environment variable ZEP_ISBOOTABLE is "yes", below
+  // "hostline/toqrv/vantor/fdr_upload/" there.
+  static void FTPFile(std::string host, std::string localFile, std::string remoteName);
+  static void sFTPFile(std::string host, std::string localFile, std::string remoteName);
+
+  // Downloads ftp://host/name or sftp://host/name.
+  static void FTPFileFromQRV(std::string host, std::string localFile, std::string remoteName);
+  static void sFTPFileFromQRV(std::string host, std::string localFile, std::string remoteName);
+
+  // Uploads to ftp://host/name.xml.gz, after saying "Remote file name = name.xml.gz" on standard output.
+  static void UserFTPFile(std::string host, std::string localFile, std::string name);
+
+  // Fetches a web page, chosen when the library is built, through the proxy and appends it to ./content.html.
+  // `userAndPassword` is "user:password"; the last argument is not used. Returns kZEPStatusOK when something came back, which
+  // may be the proxy's own refusal: look at the file. A failing fetch is logged as an error and returns
+  // kZEPStatusConnectionFailed when the proxy is unknown or nobody answers there, else kZEPStatusAccessDenied. Throws
+  // kZEPStatusLibCurlFailure, with an error in the log, when libcurl cannot be had or set up.
+  static TZEPStatusCode CheckProxySetting(std::string proxy, std::string port, std::string userAndPassword, long unused);
+
+  // 0 when the system knows an address of the host, 1 when not, whatever the name says; with a line in the log at debug
+  // severity. The second argument is not used.
+  static int DetectHostnameAvailable(std::string hostName, std::string unused);
+
+  // ---- Removable media and devices (TOSSpecificMedia.cpp) ----
+  //
+  // Devices are mounted and unmounted by the system's own commands, run through the shell. Names are put into the command
+  // line as they are, without quotes: hand on none that was not checked.
+
+  // Mounts a device, or else its first partition (the name with a "1" behind it), and returns the mount point: "/mnt/floppy"
+  // for exactly "/dev/floppy", "/dev/fd0" and "/dev/fd1", "/mnt/key" for any other. When anything is mounted there already,
+  // that stays and nothing is mounted: the mount point then need not be the device's. Throws kZEPStatusFileSystemError when
+  // neither can be mounted; why, the command keeps to itself. The mount point must exist.
+  static std::string MountDevice(std::string device);
+
+  // Unmounts what is mounted at `mountPoint`; the device is not looked at. Throws kZEPStatusFileSystemError when the command
+  // fails.
+  static void UnmountDevice(std::string device, std::string mountPoint);
+
+  // Appends the device files of the virtual devices that the management controller shows to this host, as the program
+  // "hwinfo" tells them: `kind` is 0 for disks, 1 for CD-ROMs, 2 for keyboards, 3 for mice; for any other nothing is run. An
+  // alias in parentheses behind a name is kept with `keepWhole` ("/dev/sdc (/dev/sg3)"), except for CD-ROMs, and cut off
+  // without. Nothing is appended when hwinfo is missing; 300 seconds of silence are allowed to it.
+  static void getxBMCVirtualDevices(int kind, std::vector<std::string>& devices, bool keepWhole);
+
+  // Finds the USB disks among the instances of the namespace's class QRVSG_SCSIDevice, mounts each as MountDevice does, and
+  // adds the floppy drive, unmounted, when the machine has one. In the order of the instances.
+  //
+  // A disk is an instance whose DeviceType is "Direct Access Device". Its DeviceID is its SCSI address as Linux writes it,
+  // "host:channel:target:lun", or a generic SCSI node, "/dev/sg2", which is asked for it; a node /dev/sda to /dev/sdz of the
+  // same address is its device. It is a USB disk when the kernel's list of USB devices holds the one that sysfs shows above
+  // it. The description is VendorID and ProductID.
+  //
+  // All disks share the one mount point: of several only the first is mounted, the others get the same mount point. Nodes
+  // that cannot be asked, instances without a node and failures to mount are logged at debug severity. What the namespace
+  // throws is passed on: kZEPStatusNotFound when it has no such class.
+  static std::vector<TRemovableMedium> EnumerateRemovableMedia(boost::shared_ptr<ICIMNamespace> ns);
 
   // ---- Log (TOSSpecificLog.cpp) ----
 

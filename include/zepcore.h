@@ -3,6 +3,7 @@
 // Every public header of the library.
 
 #include "AssertionHandler.h"
+#include "AutoProxyDiscovery.h"
 #include "ICIMClass.h"
 #include "ICIMElement.h"
 #include "ICIMInstance.h"
@@ -14,6 +15,7 @@
 #include "ICIMPropertyDecl.h"
 #include "ICIMQualifier.h"
 #include "ICIMQualifierDecl.h"
+#include "IIPMILan.h"
 #include "ILogger.h"
 #include "INamespaceConsumer.h"
 #include "INamespaceProvider.h"

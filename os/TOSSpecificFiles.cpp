@@ -46,8 +46,8 @@ void CopyInKernel(int from, int to) {
   off_t copied = 0;
   for (ssize_t got; (got = ::copy_file_range(from, nullptr, to, nullptr, kAtATime, 0)) > 0;) copied += got;
   off_t const start = copied - copied % static_cast<off_t>(kChunkSize);
-  ::lseek(from, start, SEEK_SET);
-  ::lseek(to, start, SEEK_SET);
+  if (::lseek(from, start, SEEK_SET) != start || ::lseek(to, start, SEEK_SET) != start)
+    throw TZEPException(kZEPStatusFileSystemError);
 }
 
 // Returns the last result of read or write: 0 at the end of the source, below 0 for a failure.

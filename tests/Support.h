@@ -54,6 +54,13 @@ std::size_t SlotOf(TMember member) {
   return (offset - 1) / sizeof(void*) + 1;
 }
 
+// A sanitizer makes some calls for itself: vfork among them, which that for threads turns into fork.
+#if defined(__has_feature)
+constexpr bool kIsSanitized = __has_feature(address_sanitizer) || __has_feature(thread_sanitizer);
+#else
+constexpr bool kIsSanitized = false;
+#endif
+
 // A fresh directory, removed with everything in it at the end.
 class TTempDir {
 public:

@@ -1,5 +1,6 @@
 #include "TRootObject.h"
 
+#include "IIPMILan.h"
 #include "TLogger.h"
 #include "TNamespaceProviderManager.h"
 
@@ -8,6 +9,8 @@ namespace NQRVZEP20 {
 boost::shared_ptr<INamespaceProviderManager> TRootObject::GetNamespaceProviderManager() {
   return TNamespaceProviderManager::GetInstance();
 }
+
+IIPMILan* TRootObject::GetipmiLanIns() { return IIPMILan::GetInstance(); }
 
 ILogger* TRootObject::GetCoreLogger() { return TLogger::GetInstance(); }
 

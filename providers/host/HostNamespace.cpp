@@ -1,6 +1,7 @@
 #include "HostNamespace.h"
 
 #include "HostRecords.h"
+#include "ScsiRecords.h"
 #include "SmbiosRecords.h"
 #include "TNamespaceWriter.h"
 #include "TSmbiosReader.h"
@@ -59,6 +60,9 @@ void FillHostNamespace(TMemoryNamespace& ns) {
             [&](TSmbiosStructure const& memoryDevice, unsigned number) {
               return MemoryRecord(memoryDevice, tables.SourceOf(kSmbiosMemoryDevice), number);
             });
+
+  std::string const scsi = ScsiDirectory();
+  writer.Write(ScsiShape(name), ScsiRecords(scsi, name), WhyNoScsiDevices(scsi));
   writer.WriteMissing();
 }
 

@@ -14,7 +14,7 @@ namespace NQRVZEP20 {
 
 namespace {
 
-constexpr std::size_t kMostNestedKeys = 20;  // the text of such a path doubles with each
+constexpr std::size_t kMostNestedKeys = 8;  // the text of such a path doubles with each
 
 const TCIMContext kNone;
 
@@ -92,7 +92,7 @@ TCIMValue TMofInstances::PathOf(TMofPlace const& alias) {
   const auto found = fAliases.find(FoldName(NameAt(alias)));
   if (found == fAliases.end()) throw TMofError(alias, NameAt(alias) + " is the alias of no instance", kZEPStatusNotFound);
   if (fMade[found->second].fKeys == kBeingSet) throw TMofError(alias, NameAt(alias) + " is needed to tell its own keys");
-  if (fDepth > kMostNestedKeys) throw TMofError(alias, "keys lead from one instance to another more than 20 deep");
+  if (fDepth > kMostNestedKeys) throw TMofError(alias, "keys lead from one instance to another more than 8 deep");
   SetKeys(found->second);
   TCIMReference path = fMade[found->second].fInstance->GetPath(kNone);
   return TCIMValue(path);

@@ -23,7 +23,7 @@ struct TRoom {
 
 TRoom const kRooms[] = {
     {"include", {}},
-    {"core", {"include"}},
+    {"core", {"include", "platform/include"}},
     {"cim/value", {"include", "core"}},
     {"cim/model", {"include", "core", "cim/value"}},
     {"os", {"include", "core", "platform/include"}},

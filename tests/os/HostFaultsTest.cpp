@@ -117,6 +117,7 @@ std::vector<TOperation> Operations() {
   std::string const openFailed = "[Error] TOSSpecific::OpenOutputFileStream --  Failed to open output file: new";
   std::string const parsing = "[Debug] TConfig::parseConfigFile(): start to parse config file";
   std::string const missing = "[Error] TConfig::parseConfigFile(): config file doesn't exist";
+  std::string const noTransfer = "threw kZEPStatusLibCurlFailure";
   std::string const mapIsEmpty = "[Error] TConfig::getValue(): map is empty";
 
   return {
@@ -207,6 +208,7 @@ std::vector<TOperation> Operations() {
         {"open", "all", EACCES, {fileError + ", not all"}},
         {"copy_file_range", "all", EXDEV, {"copied, all"}},  // whatever the kernel did not copy is read and written
         {"read", "all", EIO, {fileError + ", all"}},
+        {"lseek", "all", EIO, {fileError + ", all"}},
         {"write", "1", ENOSPC, {fileError + ", all"}},  // of the last chunk, which is written once more
         {"close", "all", EIO, {"copied, all"}}}},
       {"DirCopy",
@@ -240,7 +242,8 @@ std::vector<TOperation> Operations() {
       {"OpenOutputFileStream",
        {"opened", opening, "[Debug] TOSSpecific::OpenOutputFileStream -- Exting "},
        {{"fopen64", "1", EACCES, {"threw kZEPStatusAccessDenied", opening, openFailed}},
-        {"fopen64", "1", EROFS, {fileError, opening, openFailed}}}},
+        {"fopen64", "1", EROFS, {fileError, opening, openFailed}},
+        {"fclose", "1", EIO, {"opened", opening, "[Debug] TOSSpecific::OpenOutputFileStream -- Exting "}}}},
       {"GetCurrentDir", {"true"}, {{"getcwd", "1", ERANGE, {"threw kZEPStatusFail"}}}},
       {"PutEnvironment",
        {"true"},
@@ -253,10 +256,37 @@ std::vector<TOperation> Operations() {
        {{"tcgetattr", "1", EIO, {"107"}}, {"tcsetattr", "all", EIO, {"107"}}, {"read", "1", EINTR, {"-1"}}}},
       {"USleep", {"0"}, {{"usleep", "1", EINTR, {"-1"}}}},
       {"LaunchCommandShell", {"0"}, {{"system", "1", EAGAIN, {"-1"}}}},
+      {"Upload",
+       {"transferred, 0123456789"},
+       {{"open", "1", EACCES, {noTransfer, "[Error] TOSSpecific|CurlTransferFile: Error getting file size"}},
+        {"fstat", "1", EIO, {noTransfer, "[Error] TOSSpecific|CurlTransferFile: Error getting file size"}},
+        {"close", "all", EIO, {"transferred, 0123456789"}},
+        {"fopen", "1", EMFILE, {noTransfer, "[Error] TOSSpecific|CurlTransferFile: Error creating file stream"}},
+        {"fclose", "1", EIO, {"transferred, 0123456789"}}}},
+      {"Download",
+       {"transferred, first second"},
+       {{"fopen", "1", EACCES, {"transferred, first second"}},  // whether the file is there
+        {"fopen",
+         "2",
+         EACCES,
+         {"threw kZEPStatusAccessDenied", "[Error] TOSSpecific|CurlTransferFile: Error performing command: "}},
+        {"fopen",
+         "3",
+         EMFILE,
+         {"threw kZEPStatusAccessDenied, first ", "[Error] TOSSpecific|CurlTransferFile: Error performing command: "}},
+        {"fclose",  // a disk that is full only then
+         "1",
+         ENOSPC,
+         {"threw kZEPStatusAccessDenied, first ", "[Error] TOSSpecific|CurlTransferFile: Error performing command: "}},
+        {"fclose",
+         "2",
+         ENOSPC,
+         {"threw kZEPStatusAccessDenied, first second", "[Error] TOSSpecific|CurlTransferFile: Error performing command: "}}}},
       {"TConfig",
        {"a,b", parsing},
        {{"stat", "all", EACCES, {"", parsing, missing, mapIsEmpty}},
         {"fopen64", "1", EACCES, {"", parsing, mapIsEmpty}},
+        {"fclose", "1", EIO, {"a,b", parsing}},
         {"read", "1", EIO, {"", parsing, mapIsEmpty}},
         {"read", "2", EIO, {"a", parsing}}}},  // the line that it broke off is not counted
   };

@@ -16,13 +16,6 @@
 
 namespace NQRVZEP20 {
 
-// A sanitizer makes some calls for itself: vfork among them, which that for threads turns into fork.
-#if defined(__has_feature)
-constexpr bool kIsSanitized = __has_feature(address_sanitizer) || __has_feature(thread_sanitizer);
-#else
-constexpr bool kIsSanitized = false;
-#endif
-
 // The path of a program of tests/os/children.
 inline std::string Child(std::string const& name) { return std::string(ZEP_CHILDREN_DIR) + "/" + name; }
 
@@ -64,7 +57,7 @@ inline bool HasChildren() {
 }
 
 // The text that the function returns in a child process, whose memory, user and mounts are its own: what it changes does
-// not come back. What it throws is text as well; a child that dies says so.
+// not come back. What it throws is text as well; a child that dies, or in which an expectation fails, says so.
 template <class TFunction>
 std::string InChild(TFunction function) {
   int ends[2];
@@ -77,6 +70,7 @@ std::string InChild(TFunction function) {
     } catch (std::exception const& thrown) {
       result = std::string("threw ") + thrown.what();
     }
+    if (testing::Test::HasFailure()) result += " (with failures)";
     bool const arrived = ::write(ends[1], result.data(), result.size()) == static_cast<ssize_t>(result.size());
     ::_exit(arrived ? 0 : 1);
   }

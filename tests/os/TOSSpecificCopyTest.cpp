@@ -341,13 +341,12 @@ TEST_F(DirCopyTest, WhatCreateDirAndFileCopyThrowPassesThrough) {
 
 TEST_F(DirCopyTest, WhatWasCopiedBeforeAFailureStays) {
   fs::create_directory(fDir.Path("one"));
-  WriteFile(fDir.Path("one/file"), "text");
-  fs::create_directory(fDir.Path("one/dir"));
-  WriteFile(fDir.Path("one/dir/x"), "");
-  fs::create_directories(fDir.Path("to"));
-  WriteFile(fDir.Path("to/dir"), "in the way");
-  EXPECT_STATUS(TOSSpecific::DirCopy(fDir.Path("one"), fDir.Path("to"), true), kZEPStatusDirectoryAlreadyExists);
-  EXPECT_EQ(ReadFile(fDir.Path("to/dir")), "in the way");
+  for (char const* name : {"a", "b", "c"}) WriteFile(fDir.Path("one/") + name, name);
+  TEntries const names = TOSSpecific::ListDir(fDir.Path("one"));
+  fs::create_directories(fDir.Path("two/") + names.back());  // where the last file is to be
+  EXPECT_STATUS(TOSSpecific::DirCopy(fDir.Path("one"), fDir.Path("two"), true), kZEPStatusFileSystemError);
+  EXPECT_EQ(ReadFile(fDir.Path("two/") + names[0]), names[0]);
+  EXPECT_EQ(ReadFile(fDir.Path("two/") + names[1]), names[1]);
 }
 
 // ---- ListDir ----

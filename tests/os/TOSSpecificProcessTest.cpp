@@ -550,6 +550,33 @@ TEST_F(SpawnProcessTest, TheCallersMemoryIsNotCopied) {
   EXPECT_LT(after - before, static_cast<long>(kPages / 10));
 }
 
+bool gForkHandlerRan = false;
+
+TEST_F(SpawnProcessTest, HandlersOfPthreadAtforkAreNotRun) {
+  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which may fork instead";
+  EXPECT_EQ(InChild([] {
+              ::pthread_atfork([] { gForkHandlerRan = true; }, nullptr, nullptr);
+              RunChild("PrintsNothing");
+              return gForkHandlerRan ? "run" : "not run";
+            }),
+            "not run");
+}
+
+int gExitStatus = -1;
+
+TEST_F(SpawnProcessTest, AFailedExecExitsWith255) {
+  EXPECT_EQ(InChild([] {
+              struct sigaction action = {};
+              action.sa_sigaction = [](int, siginfo_t* info, void*) { gExitStatus = info->si_status; };
+              action.sa_flags = SA_SIGINFO | SA_RESTART;
+              ::sigaction(SIGCHLD, &action, nullptr);
+              std::string output;
+              TOSSpecific::SpawnProcess("/nonexistent", {}, output, -1);
+              return std::to_string(gExitStatus);
+            }),
+            "255");
+}
+
 TEST_F(SpawnProcessTest, ServesManyThreads) {
   std::atomic<int> wrong{0};
   std::vector<std::thread> threads;

@@ -7,7 +7,14 @@ enum EExitStatus {
   kExitComplete = 0,  // everything that was asked for
   kExitNothing = 1,   // nothing of it
   kExitPartial = 2,   // some of it; the output says what is missing, and why
-  kExitUsage = 64     // zep was called in a way that it does not know
+  kExitUsage = 64,    // zep was called in a way that it does not know
+
+  // Of transfers only, which end with kExitNothing when the server refuses them or they break off:
+  kExitNoInput = 66,       // the file to be sent cannot be read
+  kExitNoConnection = 68,  // the host is unknown, or nobody answers there
+  kExitNoLibrary = 69,     // there is no libcurl, or none that will do
+  kExitNotWritten = 73,    // the local file is there already, or cannot be written
+  kExitStalled = 75        // nothing moved any more
 };
 
 }  // namespace NQRVZEP20::zep

@@ -1,12 +1,20 @@
 // zep report: which machine this is.
 
 #include "Commands.h"
+#include "Json.h"
 #include "Output.h"
 #include "Report.h"
 #include "Sample.h"
+#include "SendReport.h"
+#include "TMountedMedium.h"
+#include "TOSSpecific.h"
+#include "Text.h"
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
+#include <cstdio>
+#include <iostream>
 #include <memory>
 
 namespace NQRVZEP20::zep {
@@ -16,13 +24,66 @@ namespace {
 struct TArguments {
   bool fAsJson = false;
   bool fSample = false;
+  bool fBySftp = false;
+  std::string fTarget;  // empty: nowhere
+  TTransferOptions fOptions;
+  std::string fMedium;  // the device to write to; empty for standard output
 };
 
+// "zep-report-db1-20261121-041530.txt", of characters that every file system takes.
+std::string FileNameOf(TReport const& report, bool asJson) {
+  auto const isHost = [](TReportRow const& row) { return row.fKey == "hostName"; };
+  auto const row = std::find_if(report.fIdentity.begin(), report.fIdentity.end(), isHost);
+  std::string host = row != report.fIdentity.end() && row->fAnswer.fIsKnown ? row->fAnswer.fValue : "unknown";
+  for (char& c : host)
+    if (std::isalnum(static_cast<unsigned char>(c)) == 0 && c != '-') c = '_';
+  TCIMDateTime const now = TOSSpecific::GetLocalTime();
+  char time[64];
+  std::snprintf(time, sizeof time, "-%04u%02u%02u-%02u%02u%02u", unsigned{now.GetYear()}, unsigned{now.GetMonth()},
+                unsigned{now.GetDay()}, unsigned{now.GetHour()}, unsigned{now.GetMinute()}, unsigned{now.GetSecond()});
+  return "zep-report-" + host.substr(0, 64) + time + (asJson ? ".json" : ".txt");
+}
+
+// Also unmounts a medium that could not be written; the reason for that is the one that counts.
+void WriteAndUnmount(TMountedMedium const& medium, std::string const& name, std::string const& text) {
+  try {
+    medium.Write(name, text);
+  } catch (std::runtime_error const&) {
+    try {
+      UnmountDirectory(medium.MountPoint());
+    } catch (std::runtime_error const& failure) {
+      std::cerr << "zep: " << Printable(failure.what()) << "\n";
+    }
+    throw;
+  }
+  UnmountDirectory(medium.MountPoint());
+}
+
+void WriteToMedium(TReport const& report, TArguments const& arguments) {
+  std::string const name = FileNameOf(report, arguments.fAsJson);
+  std::string const text = arguments.fAsJson ? ReportAsJson(report) : ReportAsText(report);
+  TMountedMedium const medium(arguments.fMedium);
+  WriteAndUnmount(medium, name, text);
+
+  TJson document = DocumentHead("zep report --to-media");
+  document["device"] = medium.Device();
+  document["file"] = name;
+  document["bytes"] = text.size();
+  WriteOutput(arguments.fAsJson ? AsText(document)
+                                : "The report is " + name + " on " + medium.Device() + ", which can be taken out.\n");
+}
+
 int Report(TArguments const& arguments) {
+  TTarget target{};
+  if (!arguments.fTarget.empty()) target = TargetOf(arguments.fTarget, arguments.fBySftp);
+  if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
   if (arguments.fSample) SelectSample();
   TReport const report = MakeReport(LoadPlugIns());
-  WriteOutput(arguments.fAsJson ? ReportAsJson(report) : ReportAsText(report));
-  return report.fStatus;
+  if (!arguments.fMedium.empty())
+    WriteToMedium(report, arguments);
+  else
+    WriteOutput(arguments.fAsJson ? ReportAsJson(report) : ReportAsText(report));
+  return arguments.fTarget.empty() ? report.fStatus : SendReport(report, target, arguments.fOptions);
 }
 
 }  // namespace
@@ -31,9 +92,17 @@ TRun AddReportArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.add_flag("--sample", arguments->fSample, "Report on the bundled table of an invented server, labelled SAMPLE");
+  command.add_option("--to-media", arguments->fMedium,
+                     "Write the report to a file on this removable device, such as /dev/sdb, instead, and unmount it");
+  command.add_option("--send", arguments->fTarget,
+                     "Send the JSON document, packed, as well: ftp://[USER@]HOST[:PORT]/DIRECTORY/, sftp://..., or\n"
+                     "[USER@]HOST[:PORT] alone. When it cannot be sent it is kept, and where is said");
+  command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
+  AddTransferOptions(command, arguments->fOptions);
   command.footer(
       "Exit status: 0 when everything could be told, 2 when the report says what is missing, 1 when nothing\n"
-      "could be told, 64 for wrong usage.");
+      "could be told or the medium could not be written, 64 for wrong usage; when it could not be sent, as that\n"
+      "of zep send.");
   return [arguments] { return Report(*arguments); };
 }
 

@@ -90,6 +90,7 @@ FAILING(FILE*, fopen64, (char const* path, char const* mode), (path, mode), null
 FAILING(ssize_t, read, (int fd, void* buffer, size_t length), (fd, buffer, length), -1)
 FAILING(ssize_t, copy_file_range, (int from, off64_t* in, int to, off64_t* out, size_t length, unsigned int flags),
         (from, in, to, out, length, flags), -1)
+FAILING(off64_t, lseek, (int fd, off64_t offset, int whence), (fd, offset, whence), -1)
 FAILING(int, stat, (char const* path, struct stat* status), (path, status), -1)
 FAILING(int, fstat, (int fd, struct stat* status), (fd, status), -1)
 FAILING(int, mkdir, (char const* path, mode_t mode), (path, mode), -1)
@@ -136,6 +137,15 @@ EXPORT int close(int fd) {
   if (!fails) return result;
   errno = gError;
   return -1;
+}
+
+EXPORT int fclose(FILE* file) {
+  static auto* const next = Next("fclose", &fclose);
+  bool const fails = IsTheOne("fclose");
+  int const result = next(file);
+  if (!fails) return result;
+  errno = gError;
+  return EOF;
 }
 
 EXPORT int closedir(DIR* dir) {

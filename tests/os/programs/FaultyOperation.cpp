@@ -6,6 +6,7 @@
 #include "TConfig.h"
 #include "TOSSpecific.h"
 #include "tests/os/HostTools.h"
+#include "tests/os/curl/StandInCurl.h"
 
 #include <dlfcn.h>
 #include <fcntl.h>
@@ -86,6 +87,19 @@ void Type(std::string const& keys) {
   if (::dup2(terminal, 0) != 0 || ::write(keyboard, keys.data(), keys.size()) != static_cast<ssize_t>(keys.size())) ::abort();
 }
 
+TCurlRecord gCurl;
+
+void UseStandInCurl() {
+  void* const library = ::dlopen(ZEP_CURL_DIR "/whole/libcurl.so", RTLD_LAZY);  // is "libcurl.so" from now on
+  reinterpret_cast<TUseRecord*>(::dlsym(library, "StandInUse"))(&gCurl);
+  gCurl.chunks = {"first ", "second"};
+}
+
+std::string Transfer(std::string const& file, bool download) {
+  TOSSpecific::CurlTransferFile("ftp://h/f", file, download);
+  return "transferred";
+}
+
 std::string YesOrNo(bool value) { return value ? "true" : "false"; }
 
 std::map<std::string, TOperation> const kOperations = {
@@ -115,6 +129,8 @@ std::map<std::string, TOperation> const kOperations = {
     {"GetKeyboardChar", {[] { return std::to_string(TOSSpecific::GetKeyboardChar()); }, [] { return ""; }, [] { Type("k\n"); }}},
     {"USleep", {[] { return std::to_string(TOSSpecific::USleep(1)); }}},
     {"LaunchCommandShell", {[] { return std::to_string(TOSSpecific::LaunchCommandShell()); }}},
+    {"Upload", {[] { return Transfer("small", false); }, [] { return gCurl.uploaded; }, UseStandInCurl}},
+    {"Download", {[] { return Transfer("new", true); }, [] { return ReadFile("new"); }, UseStandInCurl}},
     {"TConfig", {[] { return Joined(TConfig::GetInstance()->listKeys()); }}},
     {"TConfigWithoutMemory", {KeysWithoutMemory}},
 };

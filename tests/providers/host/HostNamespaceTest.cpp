@@ -13,6 +13,7 @@
 #include "TOSSpecific.h"
 #include "providers/memory/TMemoryNamespace.h"
 #include "tests/SmbiosTables.h"
+#include "tests/providers/host/ScsiDirectory.h"
 #include "tests/providers/host/Structures.h"
 
 #include <gmock/gmock.h>
@@ -35,6 +36,7 @@ protected:
   void FillFromFile(std::string const& path) {
     TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", path.c_str());
     TEnvironmentGuard const name("ZEP_HOST_NAME", "db1");
+    TEnvironmentGuard const scsi("ZEP_SCSI_DEVICES", scsiDevices_.c_str());
     ns_ = boost::make_shared<TMemoryNamespace>("root/test");
     FillHostNamespace(*ns_);
   }
@@ -69,6 +71,7 @@ protected:
   }
 
   TTempDir dir_;
+  std::string scsiDevices_ = dir_.Path("no-scsi");
   boost::shared_ptr<TMemoryNamespace> ns_;
 };
 
@@ -129,7 +132,7 @@ TEST_F(HostNamespaceTest, ClassesComeInAFixedOrder) {
       },
       TCIMContext());
   EXPECT_THAT(names, ElementsAre("QRVSG_ComputerSystem", "QRVSG_OperatingSystem", "QRVSG_ZEPProduct", "CIM_BIOSElement",
-                                 "CIM_Chassis", "CIM_Processor", "CIM_PhysicalMemory", "ZEP_MissingValue"));
+                                 "CIM_Chassis", "CIM_Processor", "CIM_PhysicalMemory", "QRVSG_SCSIDevice", "ZEP_MissingValue"));
 }
 
 TEST_F(HostNamespaceTest, ADeclarationTellsKeyTypeAndSource) {
@@ -162,7 +165,7 @@ TEST_F(HostNamespaceTest, EveryInstanceIsFoundByItsPath) {
         return true;
       },
       TCIMContext());
-  EXPECT_EQ(found, 17);  // 1 of each single class, 2 processors, 8 modules and 2 values that are missing
+  EXPECT_EQ(found, 18);  // 1 of each single class, 2 processors, 8 modules, 2 values and 1 class that are missing
 }
 
 TEST_F(HostNamespaceTest, EachMissingValueOfAnInstanceSaysWhy) {
@@ -187,7 +190,7 @@ TEST_F(HostNamespaceTest, NothingIsNullWithoutAReason) {
             },
             TCIMContext());
     auto const missing = InstancesOf("ZEP_MissingValue");
-    EXPECT_EQ(missing.size(), static_cast<std::size_t>(nulls));
+    EXPECT_EQ(missing.size(), static_cast<std::size_t>(nulls) + 1);  // and no SCSI devices
     EXPECT_GT(nulls, 0);
     for (auto const& instance : missing) {
       EXPECT_NE(TextOf(*instance, "Reason"), "");
@@ -238,6 +241,33 @@ TEST_F(HostNamespaceTest, AMangledTableFillsANamespaceAllTheSame) {
     Fill(table.substr(0, length));
     EXPECT_EQ(InstancesOf("QRVSG_ComputerSystem").size(), 1u) << length;
   }
+}
+
+// ---- SCSI devices ----
+
+TEST_F(HostNamespaceTest, ScsiDevicesAreThoseOfSysfs) {
+  scsiDevices_ = dir_.Path("scsi");
+  TScsiDirectory(scsiDevices_).Add("1:0:0:0", "0", "Example ", "Virtual Disk    ", "0601");
+  FillFromFile(SamplePath());
+  EXPECT_EQ(TextOfOnly("QRVSG_SCSIDevice", "DeviceType"), "Direct Access Device");
+  EXPECT_EQ(TextOfOnly("QRVSG_SCSIDevice", "DeviceID"), "1:0:0:0");
+  EXPECT_EQ(TextOfOnly("QRVSG_SCSIDevice", "VendorID"), "Example");
+  EXPECT_EQ(TextOfOnly("QRVSG_SCSIDevice", "ProductID"), "Virtual Disk");
+  EXPECT_EQ(InstancesOf("QRVSG_SCSIDevice")[0]->GetPath(TCIMContext()).GetPath(),
+            "QRVSG_SCSIDevice.CreationClassName=\"QRVSG_SCSIDevice\",DeviceID=\"1:0:0:0\","
+            "SystemCreationClassName=\"QRVSG_ComputerSystem\",SystemName=\"db1\"");
+  EXPECT_THAT(MissingOf("QRVSG_SCSIDevice"), IsEmpty());
+}
+
+TEST_F(HostNamespaceTest, WithoutScsiDevicesTheClassIsThereAndSaysWhyItIsEmpty) {
+  FillFromFile(SamplePath());
+  EXPECT_THAT(InstancesOf("QRVSG_SCSIDevice"), IsEmpty());
+  EXPECT_THAT(MissingOf("QRVSG_SCSIDevice"),
+              ElementsAre(": the kernel shows no SCSI devices: " + scsiDevices_ + " does not exist"));
+  scsiDevices_ = dir_.Path("scsi");
+  TScsiDirectory const empty(scsiDevices_);
+  FillFromFile(SamplePath());
+  EXPECT_THAT(MissingOf("QRVSG_SCSIDevice"), ElementsAre(": there are no SCSI devices in " + scsiDevices_));
 }
 
 // ---- The plug-in ----

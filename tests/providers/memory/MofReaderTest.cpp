@@ -491,7 +491,7 @@ TEST(MofReaderTest, KeysThatNeedThemselvesAreRefused) {
   for (int at = 0; at < 30; ++at)
     chain += "instance of X_N as $N" + std::to_string(at) + " { Next = $N" + std::to_string(at + 1) + "; };\n";
   EXPECT_THAT(ErrorOf(chain + "instance of X_N as $N30 { };"),
-              HasSubstr("keys lead from one instance to another more than 20 deep"));
+              HasSubstr("keys lead from one instance to another more than 8 deep"));
 }
 
 TEST(MofReaderTest, AnErrorCarriesTheStatusOfTheRefusal) {

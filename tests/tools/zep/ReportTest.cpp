@@ -289,7 +289,7 @@ TEST_F(ReportTest, JsonListsEveryInstanceWithItsPath) {
                                                 {"CIM_Chassis", 1},
                                                 {"CIM_Processor", 2},
                                                 {"CIM_PhysicalMemory", 8},
-                                                {"ZEP_MissingValue", 2}}));
+                                                {"ZEP_MissingValue", 3}}));
   std::sort(paths.begin(), paths.end());
   EXPECT_EQ(std::unique(paths.begin(), paths.end()), paths.end());
 }

@@ -42,6 +42,13 @@ TEST_F(RunTest, ATimeoutOfZeroAllowsNoSilence) {
   EXPECT_EQ(run.output, "");
 }
 
+TEST_F(RunTest, AMarkMayStandBeforeTheCommand) {
+  EXPECT_EQ(Run({"--", "echo", "--", "a"}).output, "-- a\n");
+  EXPECT_EQ(Run({"--timeout", "5", "--", "sh", "-c", "echo b"}).output, "b\n");
+  EXPECT_EQ(Run({"echo", "--", "c"}).output, "-- c\n");
+  EXPECT_EQ(Run({"--"}).status, 64);
+}
+
 TEST_F(RunTest, TellsThatACommandFailed) {
   std::string const reason = " could not be executed, did not exit with 0 or was ended by a signal\n";
   for (std::vector<std::string> const& command :

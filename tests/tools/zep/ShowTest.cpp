@@ -27,7 +27,7 @@ protected:
 
 TEST_F(ShowTest, EveryPathThatOneRunPrintsAnotherOneShows) {
   auto const instances = JsonOf(Run({"report", "--json"}))["instances"];
-  EXPECT_EQ(instances.size(), 19u);
+  EXPECT_EQ(instances.size(), 20u);
   for (auto const& instance : instances) {
     TRun const run = Run({"show", instance["path"], "--json"});
     EXPECT_EQ(run.status, 0) << instance["path"] << run.errors;

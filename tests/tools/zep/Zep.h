@@ -31,6 +31,7 @@ struct TCall {
   std::string outputFile = {};      // instead of one that is read back
   int outputDescriptor = -1;        // the same, as an open descriptor
   std::string directory = {};       // to work in
+  bool hasNoTerminal = false;       // in a session of its own
 };
 
 class TInstallation {
@@ -72,8 +73,10 @@ private:
     if (call.outputDescriptor >= 0) ::dup2(call.outputDescriptor, STDOUT_FILENO);
     if (!RedirectTo(Path("err"), STDERR_FILENO)) ::_exit(126);
     if (!call.directory.empty() && ::chdir(call.directory.c_str()) != 0) ::_exit(126);
+    if (call.hasNoTerminal) ::setsid();
     std::signal(SIGPIPE, call.ignoresBrokenPipes ? SIG_IGN : SIG_DFL);
-    for (char const* name : {"ZEP_SMBIOS_TABLE", "ZEP_HOST_NAME", "LD_LIBRARY_PATH"}) ::unsetenv(name);
+    for (char const* name : {"ZEP_SMBIOS_TABLE", "ZEP_HOST_NAME", "ZEP_BMC_PASSWORD", "LD_LIBRARY_PATH"}) ::unsetenv(name);
+    ::setenv("ZEP_SCSI_DEVICES", Path("no-scsi-devices").c_str(), 1);  // whatever this machine has
     for (auto const& [name, value] : call.environment) ::setenv(name.c_str(), value.c_str(), 1);
     if (call.asNobody && !BecomeNobody()) ::_exit(126);
 

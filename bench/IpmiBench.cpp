@@ -1,0 +1,178 @@
+// The identity of remote servers from simulated controllers, by zep and by ipmitool, each run as a program; a list of a hundred
+// controllers beside the slowest of them; and the checksum of a message. Runs in a network namespace of its own, as root.
+
+#include "IIPMILan.h"
+
+#include <benchmark/benchmark.h>
+#include <fcntl.h>
+#include <net/if.h>
+#include <sched.h>
+#include <signal.h>
+#include <spawn.h>
+#include <sys/ioctl.h>
+#include <sys/socket.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <fstream>
+#include <memory>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+namespace {
+
+constexpr int kControllers = 4;               // simulators; each has room for 63 sessions
+constexpr char const* kSilent = "192.0.2.2";  // an address where nobody answers
+
+std::string AddressOf(int controller) { return "127.2.0." + std::to_string(controller % kControllers + 1); }
+
+void Do(std::string const& command) {
+  if (std::system(command.c_str()) != 0) throw std::runtime_error("failed: " + command);
+}
+
+// The network in which all runs: controllers on loopback, and an interface behind which all is silent.
+class TNetwork {
+public:
+  TNetwork() {
+    if (::unshare(CLONE_NEWNET) != 0) throw std::runtime_error("no network namespace");
+    Do("ip link set lo up && ip link add silent0 type veth peer name silent1 && ip link set silent0 arp off up && "
+       "ip link set silent1 up && ip addr add 192.0.2.1/24 dev silent0");
+    ::setenv("ZEP_BMC_PASSWORD", "zeppass1", 1);
+    for (int n = 0; n < kControllers; ++n) Start(AddressOf(n));
+  }
+  ~TNetwork() {
+    for (pid_t simulator : fSimulators) ::kill(simulator, SIGTERM);
+    for (std::FILE* script : fScripts) ::pclose(script);
+  }
+
+private:
+  void Start(std::string const& address) {
+    std::FILE* const script =
+        ::popen((ZEP_SOURCE_DIR "/tests/system/ipmi/sim/start.sh --addr " + address + " 623 2>/dev/null").c_str(), "re");
+    int simulator = 0;
+    if (std::fscanf(script, "ready pid %d", &simulator) != 1) throw std::runtime_error("no simulator");
+    fScripts.push_back(script);
+    fSimulators.push_back(simulator);
+  }
+
+  std::vector<std::FILE*> fScripts;
+  std::vector<pid_t> fSimulators;
+};
+
+void UseNetwork() { static TNetwork const network; }
+
+std::string FileOf(std::string const& name, std::string const& text) {
+  std::string const path = "/tmp/zep-ipmi-bench-" + std::to_string(::getpid()) + name;
+  std::ofstream(path) << text;
+  return path;
+}
+
+// Runs a program with its output read; its exit status and the output.
+std::pair<int, std::string> OutputOf(std::vector<std::string> const& command) {
+  int ends[2];
+  if (::pipe2(ends, O_CLOEXEC) != 0) return {-1, ""};
+  posix_spawn_file_actions_t actions;
+  posix_spawn_file_actions_init(&actions);
+  posix_spawn_file_actions_adddup2(&actions, ends[1], STDOUT_FILENO);
+  posix_spawn_file_actions_addopen(&actions, STDERR_FILENO, "/dev/null", O_WRONLY, 0);
+  std::vector<char*> arguments;
+  for (std::string const& argument : command) arguments.push_back(const_cast<char*>(argument.c_str()));
+  arguments.push_back(nullptr);
+  pid_t child = -1;
+  ::posix_spawnp(&child, arguments[0], &actions, nullptr, arguments.data(), environ);
+  posix_spawn_file_actions_destroy(&actions);
+  ::close(ends[1]);
+  std::string output;
+  char chunk[4096];
+  for (ssize_t got; (got = ::read(ends[0], chunk, sizeof chunk)) > 0;) output.append(chunk, static_cast<std::size_t>(got));
+  ::close(ends[0]);
+  int status = -1;
+  if (child > 0) ::waitpid(child, &status, 0);
+  return {WEXITSTATUS(status), output};
+}
+
+void RunRepeatedly(benchmark::State& state, std::vector<std::string> const& command, std::string const& expected,
+                   int status = 0) {
+  auto const [result, output] = OutputOf(command);
+  if (result != status || output.find(expected) == std::string::npos) return state.SkipWithError("unexpected result");
+  for (auto _ : state) {
+    auto run = OutputOf(command);
+    benchmark::DoNotOptimize(run);
+  }
+}
+
+void Identity_Zep(benchmark::State& state) {
+  UseNetwork();
+  RunRepeatedly(state, {ZEP_PROGRAM, "remote", AddressOf(0), "--user", "zepadmin"}, "KQ12345");
+}
+BENCHMARK(Identity_Zep)->UseRealTime();
+
+// The same three reads in one session.
+void Identity_ipmitool(benchmark::State& state) {
+  UseNetwork();
+  std::string const reads = FileOf(".reads",
+                                   "raw 0x0a 0x11 0x00 0xac 0x01 0x1e\nraw 0x0a 0x11 0x00 0xac 0x01 0x1e\n"
+                                   "raw 0x0a 0x11 0x00 0xcc 0x01 0x1e\n");
+  RunRepeatedly(state,
+                {"ipmitool", "-I", "lanplus", "-C", "3", "-H", AddressOf(0), "-U", "zepadmin", "-P", "zeppass1", "exec", reads},
+                "4b 51 31 32 33 34 35");
+  ::unlink(reads.c_str());
+}
+BENCHMARK(Identity_ipmitool)->UseRealTime();
+
+// A hundred controllers at once, ten of them silent.
+void Hundred_Zep(benchmark::State& state) {
+  UseNetwork();
+  std::string hosts;
+  for (int n = 0; n < 100; ++n) hosts += (n % 10 == 3 ? std::string(kSilent) : AddressOf(n)) + "\n";
+  std::string const file = FileOf(".hosts", hosts);
+  RunRepeatedly(state, {ZEP_PROGRAM, "remote", "--hosts", file, "--parallel", "100", "--user", "zepadmin"}, "KQ12345", 2);
+  ::unlink(file.c_str());
+}
+BENCHMARK(Hundred_Zep)->UseRealTime()->Iterations(1)->Repetitions(2);
+
+void Slowest_Zep(benchmark::State& state) {
+  UseNetwork();
+  RunRepeatedly(state, {ZEP_PROGRAM, "remote", kSilent, "--user", "zepadmin"}, "unknown", 1);
+}
+BENCHMARK(Slowest_Zep)->UseRealTime()->Iterations(1)->Repetitions(2);
+
+// ---- Checksum of 200 bytes ----
+
+constexpr int kMessageSize = 200;
+
+std::vector<char> Message() {
+  std::vector<char> message(kMessageSize);
+  for (int n = 0; n < kMessageSize; ++n) message[static_cast<std::size_t>(n)] = static_cast<char>(n * 7);
+  return message;
+}
+
+void Checksum_Zep(benchmark::State& state) {
+  std::vector<char> message = Message();
+  NQRVZEP20::IIPMILan& link = *NQRVZEP20::IIPMILan::Initialize();
+  for (auto _ : state) {
+    benchmark::DoNotOptimize(message.data());
+    char sum = link.GenSum(message.data(), 0, kMessageSize - 1);
+    benchmark::DoNotOptimize(sum);
+  }
+}
+BENCHMARK(Checksum_Zep);
+
+void Checksum_Loop(benchmark::State& state) {
+  std::vector<char> message = Message();
+  for (auto _ : state) {
+    benchmark::DoNotOptimize(message.data());
+    unsigned char sum = 0;
+    for (int n = 0; n < kMessageSize; ++n)
+      sum = static_cast<unsigned char>(sum + static_cast<unsigned char>(message[static_cast<std::size_t>(n)]));
+    sum = static_cast<unsigned char>(-sum);
+    benchmark::DoNotOptimize(sum);
+  }
+}
+BENCHMARK(Checksum_Loop);
+
+}  // namespace

@@ -1,0 +1,65 @@
+// Response packets of a management controller, checked in every mode: nothing outside the packet's area may be read, and
+// what is right must be what it is by the layout.
+
+#include "IIPMILan.h"
+
+#include <algorithm>
+#include <cstddef>
+#include <cstdint>
+#include <cstdlib>
+#include <vector>
+
+using NQRVZEP20::IIPMILan;
+
+namespace {
+
+// Cuts or fills the packet so that its area has what the header asks for and no byte more: behind the length byte as many
+// bytes as that says, and at least 7.
+void FitArea(std::vector<char>& packet, std::ptrdiff_t lengthPlace) {
+  constexpr std::ptrdiff_t kLeast = 7;
+  const std::ptrdiff_t place = std::max<std::ptrdiff_t>(lengthPlace, 0);
+  packet.resize(std::max(packet.size(), static_cast<std::size_t>(place + 1)));
+  const std::ptrdiff_t length = lengthPlace < 0 ? 0 : static_cast<signed char>(packet[static_cast<std::size_t>(place)]);
+  packet.resize(static_cast<std::size_t>(place + 1 + std::max(length, kLeast)));
+  packet.shrink_to_fit();
+}
+
+unsigned ByteAt(std::vector<char> const& packet, std::ptrdiff_t place) {
+  return static_cast<unsigned char>(packet.at(static_cast<std::size_t>(place)));
+}
+
+bool IsChecksumRight(std::vector<char> const& packet, std::ptrdiff_t lengthPlace) {
+  if (lengthPlace < 0) return false;
+  const std::ptrdiff_t last = lengthPlace + static_cast<signed char>(ByteAt(packet, lengthPlace));
+  unsigned sum = 0;
+  for (std::ptrdiff_t place = lengthPlace + 1; place < last; ++place) sum += ByteAt(packet, place);
+  return last >= 0 && ((sum + ByteAt(packet, last)) & 0xFF) == 0;
+}
+
+bool IsCompleted(std::vector<char> const& packet, std::ptrdiff_t lengthPlace) {
+  return lengthPlace + 7 >= 0 && ByteAt(packet, lengthPlace + 7) == 0;
+}
+
+void ExpectSame(bool checked, bool expected) {
+  if (checked != expected) std::abort();
+}
+
+}  // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
+  if (size < 6) return 0;
+  // The first byte is the length position, the rest the packet.
+  const int lengthPosition = static_cast<signed char>(data[0]);
+  std::vector<char> packet(data + 1, data + size);
+  const std::ptrdiff_t lengthPlace = lengthPosition - (packet[4] == 0 ? 16 : 0);
+  FitArea(packet, lengthPlace);
+
+  static IIPMILan& link = *IIPMILan::Initialize();
+  const bool checksum = IsChecksumRight(packet, lengthPlace);
+  const bool completed = IsCompleted(packet, lengthPlace);
+  ExpectSame(link.ChkResponse(packet.data(), lengthPosition, 0), checksum && completed);
+  ExpectSame(link.ChkResponse(packet.data(), lengthPosition, 1), checksum);
+  ExpectSame(link.ChkResponse(packet.data(), lengthPosition, 2), completed);
+  ExpectSame(link.ChkResponse(packet.data(), lengthPosition, 3), true);
+  return 0;
+}

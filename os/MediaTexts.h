@@ -1,0 +1,38 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+// What other programs and the kernel write of devices, read.
+
+// The device files in hwinfo's output of those devices whose block has a line that holds `header` and, behind it, one that
+// holds `marker`; each as hwinfo writes it, "/dev/sdc (/dev/sg3)".
+std::vector<std::string> DeviceFilesIn(std::string_view hwinfoOutput, std::string_view header, std::string_view marker);
+
+// "/dev/sdc (/dev/sg3)" becomes "/dev/sdc".
+std::string WithoutAlias(std::string const& deviceFile);
+
+struct TScsiAddress {
+  int fHost, fChannel, fTarget, fLun;
+};
+
+inline bool operator==(TScsiAddress const& a, TScsiAddress const& b) {
+  return a.fHost == b.fHost && a.fChannel == b.fChannel && a.fTarget == b.fTarget && a.fLun == b.fLun;
+}
+
+// Of "host:channel:target:lun", in decimal; empty for any other text.
+std::optional<TScsiAddress> ScsiAddressFrom(std::string_view text);
+
+// A device by its number on its USB.
+struct TUsbDevice {
+  int fBus, fDevice;
+};
+
+// Whether the kernel's list of USB devices holds it.
+bool Lists(std::string_view usbDevices, TUsbDevice const& device);
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,200 @@
+#include "TOSSpecific.h"
+#include "TZEPException.h"
+#include "core/Handles.h"
+#include "core/Log.h"
+#include "os/CurlLibrary.h"
+
+#include <fcntl.h>
+#include <netdb.h>
+#include <sys/stat.h>
+
+#include <cstdlib>
+#include <iostream>
+
+namespace NQRVZEP20 {
+namespace {
+
+constexpr TCurlMessages kTransferMessages = {
+    "TOSSpecific|CurlTransferFile: Error opening curl library: ", "TOSSpecific|CurlTransferFile: Error loading curl library: ",
+    "TOSSpecific|CurlTransferFile: Error initalizing curl", "TOSSpecific|CurlTransferFile: Error configuring curl error buffer"};
+
+constexpr TCurlMessages kProxyMessages = {
+    "TOSSpecific|CheckProxySetting: Error opening curl library: ", "TOSSpecific|CheckProxySetting: Error loading curl library: ",
+    "TOSSpecific|CheckProxySetting: Error initalizing curl",
+    "TOSSpecific|CheckProxySetting: Error configuring curl error buffer"};
+
+constexpr unsigned long kRefused = 0xFFFFFFFF;  // no chunk is as long, so libcurl stops
+
+// ---- Downloads ----
+
+bool CanBeRead(std::string const& path) { return TUniqueFile(std::fopen(path.c_str(), "r")) != nullptr; }
+
+// Asks until the answer is one of "y", "Y", "n" and "N". The end of the input counts as "n".
+bool MayOverwrite() {
+  std::cin.clear();  // an end that was met earlier does not count
+  std::clearerr(stdin);
+  std::string answer;
+  do {
+    std::cout << "Local file exists, overwrite it anyway?(y/n): " << std::flush;
+    if (!std::getline(std::cin, answer)) return false;
+  } while (answer != "y" && answer != "Y" && answer != "n" && answer != "N");
+  return answer == "y" || answer == "Y";
+}
+
+// Whether nothing is in the way of a download into that file, or was and is gone now.
+bool MakeWayFor(std::string const& path) {
+  if (!CanBeRead(path)) return true;
+  if (!MayOverwrite()) return false;
+  if (::unlink(path.c_str()) == 0) return true;
+  std::cout << "Permission denied." << std::endl;
+  return false;
+}
+
+void SetWriteContext(TCurl& curl, TCurlWriteContext& context) {
+  constexpr char const* kMessage = "TOSSpecific|CurlTransferFile: Error setting curl write function";
+  curl.Set(CURLOPT_WRITEFUNCTION, &curl_fwrite, kMessage);
+  curl.Set(CURLOPT_WRITEDATA, &context, kMessage);
+}
+
+// ---- Uploads ----
+
+void CheckStatusOf(std::string const& path) {
+  TUniqueFd const file(::open(path.c_str(), O_RDONLY));
+  struct stat status;
+  if (file && ::fstat(file.get(), &status) == 0) return;
+  LogError("TOSSpecific|CurlTransferFile: Error getting file size");
+  throw TZEPException(kZEPStatusLibCurlFailure);
+}
+
+TUniqueFile OpenForUpload(std::string const& path) {
+  CheckStatusOf(path);
+  TUniqueFile stream(std::fopen(path.c_str(), "rb"));
+  if (!stream) {
+    LogError("TOSSpecific|CurlTransferFile: Error creating file stream");
+    throw TZEPException(kZEPStatusLibCurlFailure);
+  }
+  return stream;
+}
+
+// ---- Both ----
+
+void SetUrl(TCurl& curl, std::string const& url) {
+  curl.Set(CURLOPT_URL, url.c_str(), "TOSSpecific|CurlTransferFile: Error setting curl target");
+}
+
+// On a download, too: an FTP server makes the missing directories before it finds that the file is missing. Kept.
+void CreateMissingDirectories(TCurl& curl) {
+  curl.Set(CURLOPT_FTP_CREATE_MISSING_DIRS, 1L,
+           "TOSSpecific|CurlTransferFile: Error setting curl option: CURLOPT_FTP_CREATE_MISSING_DIRS");
+}
+
+void PerformTransfer(TCurl& curl) {
+  CURLcode const result = curl.Perform();
+  if (result == CURLE_OK) return;
+  if (result == CURLE_COULDNT_RESOLVE_HOST || result == CURLE_COULDNT_CONNECT) {
+    LogError("TOSSpecific|CurlTransferFile: Error connecting to Server");
+    throw TZEPException(kZEPStatusConnectionFailed);
+  }
+  LogError("TOSSpecific|CurlTransferFile: Error performing command: ", curl.ErrorText());
+  throw TZEPException(kZEPStatusAccessDenied);
+}
+
+void Download(TCurl& curl, std::string const& url, std::string const& localFile) {
+  if (!MakeWayFor(localFile)) return;
+  TCurlWriteContext context{localFile, nullptr};
+  SetWriteContext(curl, context);
+  SetUrl(curl, url);
+  CreateMissingDirectories(curl);
+  PerformTransfer(curl);
+}
+
+void Upload(TCurl& curl, std::string const& url, TUniqueFile& stream, std::string const& localFile) {
+  stream = OpenForUpload(localFile);
+  curl.Set(CURLOPT_UPLOAD, 1L, "TOSSpecific|CurlTransferFile: Error setting curl upload");
+  SetUrl(curl, url);
+  curl.Set(CURLOPT_READDATA, stream.get(), "TOSSpecific|CurlTransferFile: Error setting curl upload file");
+  CreateMissingDirectories(curl);
+  PerformTransfer(curl);
+}
+
+// Where an upload goes on the server: on bootable media always into the directory that the maker's server has for them.
+std::string RemotePathOf(std::string const& remoteName) {
+  char const* const isBootable = std::getenv("ZEP_ISBOOTABLE");
+  if (isBootable != nullptr && std::string(isBootable) == "yes") return "hostline/toqrv/vantor/fdr_upload/" + remoteName;
+  return remoteName;
+}
+
+}  // namespace
+
+unsigned long curl_fwrite(void* data, unsigned long size, unsigned long count, void* context) {
+  auto* const write = static_cast<TCurlWriteContext*>(context);
+  if (write == nullptr || write->fPath.empty()) return kRefused;
+  write->fStream = std::fopen(write->fPath.c_str(), "ab");
+  if (write->fStream == nullptr) return kRefused;
+  std::setvbuf(write->fStream, nullptr, _IONBF, 0);  // a tenth less for a download: a buffer would be made for each chunk
+  unsigned long const written = std::fwrite(data, size, count, write->fStream);
+  // Some file systems tell only now that the disk is full: nothing of the chunk counts as written then.
+  bool const isClosed = std::fclose(write->fStream) == 0;
+  write->fStream = nullptr;
+  return isClosed ? written : 0;
+}
+
+void TOSSpecific::CurlTransferFile(std::string url, std::string localFile, bool download) {
+  TUniqueFile stream;  // of an upload; open until libcurl is gone
+  TCurl curl(kTransferMessages);
+  curl.Set(CURLOPT_FTP_USE_EPSV, 0L, "TOSSpecific|CurlTransferFile: Error configuring curl passive mode");
+  curl.Set(CURLOPT_PROXY, "", "TOSSpecific|CurlTransferFile: Error configuring curl proxy server");
+  if (download)
+    Download(curl, url, localFile);
+  else
+    Upload(curl, url, stream, localFile);
+}
+
+void TOSSpecific::FTPFile(std::string host, std::string localFile, std::string remoteName) {
+  CurlTransferFile("ftp://" + host + "/" + RemotePathOf(remoteName), localFile, false);
+}
+
+void TOSSpecific::sFTPFile(std::string host, std::string localFile, std::string remoteName) {
+  CurlTransferFile("sftp://" + host + "/" + RemotePathOf(remoteName), localFile, false);
+}
+
+void TOSSpecific::FTPFileFromQRV(std::string host, std::string localFile, std::string remoteName) {
+  CurlTransferFile("ftp://" + host + "/" + remoteName, localFile, true);
+}
+
+void TOSSpecific::sFTPFileFromQRV(std::string host, std::string localFile, std::string remoteName) {
+  CurlTransferFile("sftp://" + host + "/" + remoteName, localFile, true);
+}
+
+void TOSSpecific::UserFTPFile(std::string host, std::string localFile, std::string name) {
+  std::string const remoteName = name + ".xml.gz";
+  std::cout << "Remote file name = " << remoteName << std::endl;
+  CurlTransferFile("ftp://" + host + "/" + remoteName, localFile, false);
+}
+
+TZEPStatusCode TOSSpecific::CheckProxySetting(std::string proxy, std::string port, std::string userAndPassword, long) {
+  TCurlWriteContext page{"./content.html", nullptr};
+  TCurl curl(kProxyMessages);
+  curl.Set(CURLOPT_PROXY, proxy.c_str(), "TOSSpecific|CheckProxySetting: Error setting proxyIp");
+  curl.Set(CURLOPT_PROXYPORT, std::atol(port.c_str()), "TOSSpecific|CheckProxySetting: Error setting proxyPort");
+  curl.Set(CURLOPT_URL, ZEP_PROXY_CHECK_PAGE, "TOSSpecific|CheckProxySetting: Error setting URL");
+  SetWriteContext(curl, page);  // which complains in the name of CurlTransferFile. Kept.
+  curl.Set(CURLOPT_PROXYUSERPWD, userAndPassword.c_str(), "TOSSpecific|CheckProxySetting: Error setting userId & passwd");
+
+  CURLcode const result = curl.Perform();
+  if (result == CURLE_OK) return kZEPStatusOK;
+  LogError("TOSSpecific|CheckProxySetting: curl_easy_perform FAILed;", curl.ErrorText());
+  if (result == CURLE_COULDNT_RESOLVE_PROXY || result == CURLE_COULDNT_CONNECT) return kZEPStatusConnectionFailed;
+  return kZEPStatusAccessDenied;
+}
+
+int TOSSpecific::DetectHostnameAvailable(std::string hostName, std::string) {
+  if (::gethostbyname(hostName.c_str()) == nullptr) {
+    DebugOut("Network is unavailable.");
+    return 1;
+  }
+  DebugOut("Network is ok.");
+  return 0;  // 0 means available, whatever the name says. Kept.
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,37 @@
+#ifndef ZEP_PLATFORM_USBLAN_H
+#define ZEP_PLATFORM_USBLAN_H
+
+/*
+ * The bring-up library of the controller's USB-LAN, ovdusblan.so. The core loads it at run time by GetNodes,
+ * QueryOvdLanState and BringupOvdLan and never links it.
+ *
+ * A node is an interface of this machine that leads to a controller; node n's controller has the address
+ * 169.254.(95 + n).118. Nothing is remembered between calls. Changes need the right to configure interfaces.
+ *
+ * The interfaces are the USB network interfaces (drivers cdc_ether, cdc_subset, rndis_host) of the caller's network
+ * namespace, in the order of their names, but for those with an IPv4 address that is not link-local: such a one leads
+ * elsewhere. The environment variable ZEP_USBLAN_INTERFACES names other interfaces instead, in the order of the nodes and
+ * separated by blanks. The first 16 count.
+ */
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+int GetNodes(void);
+
+/* 1 when the interface of the node is up and has an address from which the controller is reached directly, else 0. */
+int QueryOvdLanState(int node);
+
+/*
+ * Takes the interface of the node up and gives it the address 169.254.(95 + n).1/24, unless it has one already from which
+ * the controller is reached. Other addresses stay. Returns 0, or an errno value: ENODEV when there is no such node, EPERM
+ * without the right to configure it.
+ */
+int BringupOvdLan(int node);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif

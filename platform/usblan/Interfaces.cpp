@@ -1,0 +1,173 @@
+#include "platform/usblan/Interfaces.h"
+
+#include <errno.h>
+#include <ifaddrs.h>
+#include <linux/rtnetlink.h>
+#include <net/if.h>
+#include <sys/ioctl.h>
+#include <sys/socket.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cstring>
+#include <filesystem>
+#include <map>
+#include <memory>
+#include <sstream>
+#include <system_error>
+
+namespace usblan {
+namespace {
+
+constexpr std::uint32_t AddressOf(int a, int b, int c, int d) {
+  return static_cast<std::uint32_t>(a) << 24 | static_cast<std::uint32_t>(b) << 16 | static_cast<std::uint32_t>(c) << 8 |
+         static_cast<std::uint32_t>(d);
+}
+
+constexpr int kFirstThirdOctet = 95;  // of node 0
+
+[[noreturn]] void ThrowSystemError(int error) { throw std::system_error(error, std::system_category()); }
+
+class TSocket {
+public:
+  TSocket(int domain, int type, int protocol) : fFd(::socket(domain, type | SOCK_CLOEXEC, protocol)) {
+    if (fFd < 0) ThrowSystemError(errno);
+  }
+  ~TSocket() { ::close(fFd); }
+  TSocket(TSocket const&) = delete;
+  TSocket& operator=(TSocket const&) = delete;
+
+  int Fd() const { return fFd; }
+
+private:
+  int fFd;
+};
+
+std::uint32_t NumberOf(sockaddr const* address) {
+  sockaddr_in version4;
+  std::memcpy(&version4, address, sizeof version4);
+  return ntohl(version4.sin_addr.s_addr);
+}
+
+bool IsLinkLocal(TAddress const& address) { return address.address >> 16 == AddressOf(169, 254, 0, 0) >> 16; }
+
+bool IsController(std::vector<TInterface>::value_type const& interface, std::string const& classNet) {
+  return IsUsbNetwork(classNet, interface.name) &&
+         std::all_of(interface.addresses.begin(), interface.addresses.end(), IsLinkLocal);
+}
+
+std::vector<TInterface> Named(std::vector<TInterface> const& all, std::string const& names) {
+  std::vector<TInterface> found;
+  std::istringstream words(names);
+  for (std::string name; words >> name;) {
+    auto const place = std::find_if(all.begin(), all.end(), [&](TInterface const& interface) { return interface.name == name; });
+    if (place != all.end()) found.push_back(*place);
+  }
+  return found;
+}
+
+// The request to add an address, as the kernel's route socket takes it.
+struct TNewAddress {
+  nlmsghdr header;
+  ifaddrmsg message;
+  struct {
+    rtattr head;
+    std::uint32_t address;  // in network byte order
+  } local, own;
+};
+
+TNewAddress NewAddress(unsigned interface, std::uint32_t address) {
+  TNewAddress request{};
+  request.header.nlmsg_len = sizeof request;
+  request.header.nlmsg_type = RTM_NEWADDR;
+  request.header.nlmsg_flags = NLM_F_REQUEST | NLM_F_ACK | NLM_F_CREATE | NLM_F_EXCL;
+  request.message.ifa_family = AF_INET;
+  request.message.ifa_prefixlen = kPrefixLength;
+  request.message.ifa_scope = RT_SCOPE_LINK;
+  request.message.ifa_index = interface;
+  request.local = {{sizeof request.local, IFA_LOCAL}, htonl(address)};
+  request.own = {{sizeof request.own, IFA_ADDRESS}, htonl(address)};
+  return request;
+}
+
+// What the kernel says to a request that it was asked to acknowledge: 0 or an errno value.
+int AcknowledgedError(int socket) {
+  struct {
+    nlmsghdr header;
+    nlmsgerr error;
+    char rest[512];
+  } answer{};
+  if (::recv(socket, &answer, sizeof answer, 0) < 0) return errno;
+  return answer.header.nlmsg_type == NLMSG_ERROR ? -answer.error.error : EPROTO;
+}
+
+}  // namespace
+
+std::uint32_t ControllerAddress(int node) { return AddressOf(169, 254, kFirstThirdOctet + node, 118); }
+
+std::uint32_t OwnAddress(int node) { return AddressOf(169, 254, kFirstThirdOctet + node, 1); }
+
+std::vector<TInterface> AllInterfaces() {
+  ifaddrs* first = nullptr;
+  if (::getifaddrs(&first) != 0) ThrowSystemError(errno);
+  const std::unique_ptr<ifaddrs, decltype(&::freeifaddrs)> list(first, ::freeifaddrs);
+  std::map<std::string, TInterface> byName;
+  for (ifaddrs const* entry = first; entry != nullptr; entry = entry->ifa_next) {
+    const std::string name = entry->ifa_name;
+    TInterface& interface = byName[name.substr(0, name.find(':'))];  // without the label of an address
+    interface.name = name.substr(0, name.find(':'));
+    interface.isUp = (entry->ifa_flags & IFF_UP) != 0;
+    if (entry->ifa_addr != nullptr && entry->ifa_addr->sa_family == AF_INET && entry->ifa_netmask != nullptr)
+      interface.addresses.push_back({NumberOf(entry->ifa_addr), NumberOf(entry->ifa_netmask)});
+  }
+  std::vector<TInterface> all;
+  for (auto& [name, interface] : byName) all.push_back(std::move(interface));
+  return all;
+}
+
+bool IsUsbNetwork(std::string const& classNet, std::string const& name) {
+  std::error_code error;
+  const std::string driver = std::filesystem::read_symlink(classNet + "/" + name + "/device/driver", error).filename().string();
+  return !error && (driver == "cdc_ether" || driver == "cdc_subset" || driver == "rndis_host");
+}
+
+std::vector<TInterface> ControllerInterfaces(std::vector<TInterface> const& all, std::string const& named,
+                                             std::string const& classNet) {
+  std::vector<TInterface> found;
+  if (!named.empty())
+    found = Named(all, named);
+  else
+    std::copy_if(all.begin(), all.end(), std::back_inserter(found),
+                 [&](TInterface const& interface) { return IsController(interface, classNet); });
+  found.resize(std::min<std::size_t>(found.size(), kMaxNodes));
+  return found;
+}
+
+bool Reaches(TInterface const& interface, int node) {
+  const std::uint32_t controller = ControllerAddress(node);
+  const auto reaches = [controller](TAddress const& own) {
+    return own.address != controller && (own.address & own.mask) == (controller & own.mask) && own.mask != 0;
+  };
+  return interface.isUp && std::any_of(interface.addresses.begin(), interface.addresses.end(), reaches);
+}
+
+void AddOwnAddress(TInterface const& interface, int node) {
+  const unsigned index = ::if_nametoindex(interface.name.c_str());
+  if (index == 0) ThrowSystemError(ENODEV);
+  const TSocket socket(AF_NETLINK, SOCK_RAW, NETLINK_ROUTE);
+  const TNewAddress request = NewAddress(index, OwnAddress(node));
+  if (::send(socket.Fd(), &request, sizeof request, 0) < 0) ThrowSystemError(errno);
+  const int error = AcknowledgedError(socket.Fd());
+  if (error != 0 && error != EEXIST) ThrowSystemError(error);
+}
+
+void TakeUp(TInterface const& interface) {
+  const TSocket socket(AF_INET, SOCK_DGRAM, 0);
+  ifreq request{};
+  interface.name.copy(request.ifr_name, IFNAMSIZ - 1);
+  if (::ioctl(socket.Fd(), SIOCGIFFLAGS, &request) != 0) ThrowSystemError(errno);
+  request.ifr_flags = static_cast<short>(request.ifr_flags | IFF_UP);
+  if (::ioctl(socket.Fd(), SIOCSIFFLAGS, &request) != 0) ThrowSystemError(errno);
+}
+
+}  // namespace usblan

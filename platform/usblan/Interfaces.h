@@ -1,0 +1,48 @@
+#pragma once
+
+#include <netinet/in.h>
+
+#include <string>
+#include <vector>
+
+namespace usblan {
+
+constexpr int kMaxNodes = 16;
+
+// An IPv4 address with its network, in host byte order.
+struct TAddress {
+  std::uint32_t address, mask;
+};
+
+struct TInterface {
+  std::string name;
+  bool isUp = false;
+  std::vector<TAddress> addresses = {};
+};
+
+// The controller's address of a node, and the address that this side gets; both within a network of 24 bits.
+std::uint32_t ControllerAddress(int node);
+std::uint32_t OwnAddress(int node);
+constexpr int kPrefixLength = 24;
+
+// All interfaces of the caller's network namespace, by name. Throws std::system_error.
+std::vector<TInterface> AllInterfaces();
+
+// Whether the interface is a USB network interface, by what the kernel tells below `classNet` ("/sys/class/net").
+bool IsUsbNetwork(std::string const& classNet, std::string const& name);
+
+// Those of `all` that lead to a controller, in the order of the nodes: the ones that `named` names, separated by blanks; with
+// an empty `named` the USB network interfaces without an address outside of the link-local range.
+std::vector<TInterface> ControllerInterfaces(std::vector<TInterface> const& all, std::string const& named,
+                                             std::string const& classNet);
+
+// Whether it is up and reaches the controller of the node directly.
+bool Reaches(TInterface const& interface, int node);
+
+// Gives the interface the node's own address; one that it has already stays. Throws std::system_error.
+void AddOwnAddress(TInterface const& interface, int node);
+
+// Throws std::system_error.
+void TakeUp(TInterface const& interface);
+
+}  // namespace usblan

@@ -1,0 +1,287 @@
+// The identity of a remote server, with a stand-in for the IPMI client library, and the files of debug sessions.
+
+#include "TOSSpecific.h"
+
+#include "TLogger.h"
+#include "tests/SmbiosTables.h"
+#include "tests/ipmi/standin/LoadStandIn.h"
+#include "tests/os/FakeClock.h"
+
+#include <gmock/gmock.h>
+#include <unistd.h>
+
+namespace NQRVZEP20 {
+namespace {
+
+using testing::ElementsAre;
+
+using TRemoteOperation = std::string (*)(std::string, std::string, std::string);
+
+struct TOperation {
+  char const* name;
+  TRemoteOperation call;
+  char const* offset;  // low and high byte, as the stand-in writes them
+};
+
+TOperation const kOperations[] = {
+    {"GetRemoteMSN", TOSSpecific::GetRemoteMSN, "cc 01"},
+    {"GetRemoteMT", TOSSpecific::GetRemoteMT, "ac 01"},
+    {"GetRemoteMachineModel", TOSSpecific::GetRemoteMachineModel, "ac 01"},
+};
+
+std::string const kOpened = "[Debug] > OpenConnection(3, bmc.example, 623, zepadmin, secret)";
+
+std::string Sent(TOperation const& operation) {
+  return std::string("[Debug] > SendIpmiCommand(11, 00 ") + operation.offset + " 1e, 4, cleared buffer, 0, ff, 0a)";
+}
+
+// An answer as a controller gives it: the count, then 30 bytes of FRU data.
+std::string Answer(std::string const& text) { return "\x1E" + text + "\0"s + std::string(29 - text.size(), ' '); }
+
+class RemoteIdentityTest : public testing::Test {
+protected:
+  // Calls the operation with the answer given.
+  std::string ResultOf(TRemoteOperation operation, std::string const& answer, int length = -1) {
+    standIn_.response = answer;
+    standIn_.responseLength = length;
+    return operation("bmc.example", "zepadmin", "secret");
+  }
+
+  TStandInIpmiClient& standIn_ = LoadStandInIpmiClient();
+};
+
+TEST_F(RemoteIdentityTest, EachOperationReadsItsPartOfTheFruData) {
+  EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMSN, Answer("KQ12345")), "KQ12345");
+  EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMT, Answer("1234AB7")), "1234");
+  EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMachineModel, Answer("1234AB7")), "AB7");
+}
+
+TEST_F(RemoteIdentityTest, TheResultIsCutOutOfTheResponse) {
+  struct TRow {
+    char const* what;
+    std::string answer;
+    char const *serialNumber, *type, *model;
+  };
+  TRow const rows[] = {
+      {"longer than each field", Answer("1234567890abcdefghij"), "1234567", "1234", "567890abcdefghij"},
+      {"no zero byte at all", "\x1E" + std::string(30, 'x'), "xxxxxxx", "xxxx", "xxxxxxxxxxxxxxxxxxxxxxxxxx"},
+      {"a count that is a character",
+       "\x41"
+       "1234AB7\0"s,
+       "1234AB7", "1234", "AB7"},
+      {"three bytes, as counted",
+       "\x03"
+       "ABC"s,
+       "ABC", "ABC", ""},
+      {"five bytes",
+       "\x05"
+       "12345"s,
+       "12345", "1234", "5"},
+      {"the count alone", "\0"s, "", "", ""},
+      {"nothing", "", "", "", ""},
+      {"blanks", "\x1E" + std::string(30, ' '), "       ", "    ", "                          "},
+      {"bytes above 127", "\x1E" + std::string(30, '\xFF'), "\xFF\xFF\xFF\xFF\xFF\xFF\xFF", "\xFF\xFF\xFF\xFF",
+       "\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF\xFF"},
+      {"a model that begins with its end", Answer("1234"), "1234", "1234", ""},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.what);
+    std::string serialNumber = ResultOf(TOSSpecific::GetRemoteMSN, row.answer);
+    serialNumber.resize(std::min(serialNumber.size(), serialNumber.find('\0')));  // what lies behind it is the next test's
+    EXPECT_EQ(serialNumber, row.serialNumber);
+    EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMT, row.answer), row.type);
+    EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMachineModel, row.answer), row.model);
+  }
+}
+
+TEST_F(RemoteIdentityTest, SerialNumberAndTypeHaveTheirLengthAlsoAroundAZeroByte) {
+  EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMSN,
+                     "\x1E"
+                     "AB\0DEFG hi"s),
+            "AB\0DEFG"s);
+  EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMT,
+                     "\x1E"
+                     "\0"
+                     "12AB7"s),
+            "\0"
+            "12A"s);
+  EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMSN,
+                     "\x1E"
+                     "AB\0\0\0\0\0hi"s),
+            "AB")
+      << "zeros at the end are none of it";
+}
+
+TEST_F(RemoteIdentityTest, TheWholeBufferMayBeFilled) {
+  std::string const full(256, 'f');
+  EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMSN, full), "fffffff");
+  EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMachineModel, full), std::string(251, 'f')) << "ends with the buffer";
+  for (int length : {0, 1, 65535})  // whatever the library says that it wrote
+    EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMT, Answer("1234AB7"), length), "1234") << length;
+}
+
+TEST_F(RemoteIdentityTest, ASuccessIsLoggedWithTheResponseAsText) {
+  for (TOperation const& operation : kOperations) {
+    SCOPED_TRACE(operation.name);
+    EXPECT_THAT(LogOf([&] { ResultOf(operation.call, Answer("1234AB7")); }),
+                ElementsAre(kOpened, Sent(operation),
+                            "[Debug] SendIpmiCommand successfully. \nrspBuffer for " + std::string(operation.name) + ":",
+                            "[Debug] \x1E"
+                            "1234AB7"));
+    EXPECT_THAT(LogOf([&] { ResultOf(operation.call, std::string(256, 'f')); }),
+                testing::Contains("[Debug] " + std::string(256, 'f')));
+  }
+}
+
+TEST_F(RemoteIdentityTest, WithoutASessionTheResultIsEmptyAndNothingIsAsked) {
+  for (int result : {1, -1, 1000})
+    for (TOperation const& operation : kOperations) {
+      SCOPED_TRACE(operation.name);
+      standIn_.openResult = result;
+      EXPECT_THAT(LogOf([&] { EXPECT_EQ(ResultOf(operation.call, Answer("1234AB7")), ""); }), ElementsAre(kOpened));
+    }
+}
+
+TEST_F(RemoteIdentityTest, AFailedCommandGivesNotAvailable) {
+  for (int result : {1, -1, 1000})
+    for (TOperation const& operation : kOperations) {
+      SCOPED_TRACE(operation.name);
+      standIn_.sendResult = result;
+      EXPECT_THAT(LogOf([&] { EXPECT_EQ(ResultOf(operation.call, Answer("1234AB7")), "N/A"); }),
+                  ElementsAre(kOpened, Sent(operation)));
+    }
+}
+
+TEST(RemoteIdentityWithoutAFunctionTest, WithoutOpenConnectionTheResultIsEmpty) {
+  LoadStandInIpmiClient("without-open");
+  for (TOperation const& operation : kOperations) EXPECT_EQ(operation.call("h", "u", "p"), "") << operation.name;
+}
+
+TEST(RemoteIdentityWithoutAFunctionTest, WithoutSendIpmiCommandTheResultIsNotAvailable) {
+  LoadStandInIpmiClient("without-send");
+  for (TOperation const& operation : kOperations) EXPECT_EQ(operation.call("h", "u", "p"), "N/A") << operation.name;
+}
+
+TEST(RemoteIdentityWithoutAFunctionTest, ClosingIsNotNeeded) {
+  LoadStandInIpmiClient("without-close").response = Answer("1234AB7");
+  EXPECT_EQ(TOSSpecific::GetRemoteMT("h", "u", "p"), "1234");
+}
+
+// ---- SetDebugLevel ----
+
+class SetDebugLevelTest : public testing::Test {
+protected:
+  SetDebugLevelTest() : directory_(std::filesystem::current_path()) { std::filesystem::current_path(dir_.Path()); }
+  ~SetDebugLevelTest() override {
+    std::filesystem::current_path(directory_);
+    TLogger::SetLogThreshold(ILogger::kLogStatus);
+  }
+
+  void UseTable(std::string const& table) {
+    WriteFile(dir_.Path("table"), table);
+    ::setenv("ZEP_SMBIOS_TABLE", dir_.Path("table").c_str(), 1);
+  }
+
+  bool SetDebugLevel(int level, std::string path) { return TOSSpecific::SetDebugLevel(level, path.data()); }
+
+  static ILogger::EZEPLogSeverity Threshold() { return TLogger::GetInstance()->GetLogThreshold(); }
+
+  TTempDir dir_;
+  std::filesystem::path const directory_;
+  TEnvironmentGuard const table_{"ZEP_SMBIOS_TABLE", "/nonexistent"}, zone_{"TZ", "UTC0"};
+};
+
+std::vector<TFakeClock::TTime> const k3March2024 = {{2024, 3, 3, 9, 5, 7}};
+
+TEST_F(SetDebugLevelTest, MakesAFileNamedByTypeAndTime) {
+  TFakeClock const clock(k3March2024);
+  UseTable(RealTable("full"));
+  EXPECT_TRUE(SetDebugLevel(2, dir_.Path("zep_")));
+  EXPECT_TRUE(std::filesystem::exists(dir_.Path("zep_123420240303-090507.log")));
+  EXPECT_EQ(std::filesystem::file_size(dir_.Path("zep_123420240303-090507.log")), 0u);
+}
+
+TEST_F(SetDebugLevelTest, TheTimeIsLocal) {
+  TFakeClock const clock(k3March2024);
+  ::setenv("TZ", "XST+10", 1);
+  SetDebugLevel(2, "zep_");
+  EXPECT_TRUE(std::filesystem::exists("zep_000020240302-230507.log"));
+}
+
+TEST_F(SetDebugLevelTest, AnExistingFileIsTruncated) {
+  TFakeClock const clock(k3March2024);
+  WriteFile("a000020240303-090507.log", "earlier");
+  SetDebugLevel(2, "a");
+  EXPECT_EQ(ReadFile("a000020240303-090507.log"), "");
+}
+
+TEST_F(SetDebugLevelTest, AnEmptyPathLeadsToTheWorkingDirectory) {
+  TFakeClock const clock(k3March2024);
+  SetDebugLevel(2, "");
+  EXPECT_TRUE(std::filesystem::exists("000020240303-090507.log"));
+}
+
+TEST_F(SetDebugLevelTest, OnlyTheLevels0To4AreSet) {
+  struct TRow {
+    int level;
+    bool result;
+  };
+  TRow const rows[] = {{0, true},   {1, true},   {2, true},    {3, true},    {4, true},          {5, false},
+                       {-1, false}, {99, false}, {100, false}, {101, false}, {2147483647, false}};
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.level);
+    TTempDir const dir;
+    TLogger::SetLogThreshold(ILogger::kLogMemoryOnly);
+    EXPECT_EQ(SetDebugLevel(row.level, dir.Path("x")), row.result);
+    EXPECT_EQ(Threshold(), row.result ? row.level : static_cast<int>(ILogger::kLogMemoryOnly));
+    EXPECT_FALSE(std::filesystem::is_empty(dir.Path())) << "the file is made whatever the level is";
+  }
+}
+
+TEST_F(SetDebugLevelTest, AFileThatCannotBeMadeGoesUnnoticed) {
+  EXPECT_TRUE(SetDebugLevel(1, dir_.Path("absent/zep_")));
+  EXPECT_EQ(Threshold(), ILogger::kLogWarning);
+  EXPECT_FALSE(SetDebugLevel(7, dir_.Path("absent/zep_")));
+}
+
+TEST_F(SetDebugLevelTest, ThePathIsCutOffAfter255Bytes) {
+  TFakeClock const clock(k3March2024);
+  std::string const room = dir_.Path("");  // with its separator
+  SetDebugLevel(2, room + std::string(255 - room.size(), 'x') + "yyy");
+  EXPECT_TRUE(std::filesystem::exists(room + std::string(255 - room.size(), 'x')));
+  SetDebugLevel(2, room + std::string(250 - room.size(), 'z'));
+  EXPECT_TRUE(std::filesystem::exists(room + std::string(250 - room.size(), 'z') + "00002"));
+  std::string long_(100000, 'l');
+  EXPECT_TRUE(SetDebugLevel(2, long_)) << "such a name cannot be made";
+}
+
+TEST_F(SetDebugLevelTest, ReadsTheMachineTypeBeforeTheThresholdChanges) {
+  UseTable(RealTable("full"));
+  EXPECT_THAT(LogOf([&] { SetDebugLevel(0, dir_.Path("zep_")); }),
+              ElementsAre("[Debug] getMachineType() entered.", "[Debug] Machine type detected: 1234",
+                          "[Debug] getMachineType() completed."));
+}
+
+// Without a path the file lies in a directory of the system. Tests do not write there: they look at a tree of their own.
+TEST_F(SetDebugLevelTest, WithoutAPathTheVariantNamesTheDirectory) {
+  NEEDS(::geteuid() == 0, "root, for a mount namespace");
+  for (bool isOEM : {false, true}) {
+    SCOPED_TRACE(isOEM);
+    std::string const program = dir_.Path("in-namespace");
+    std::string const made = dir_.Path(isOEM ? "made-oem" : "made");
+    if (isOEM) {
+      std::filesystem::create_directory("docs");
+      WriteFile("docs/oem_zep_preboot_readme.txt", "");
+    }
+    WriteFile(program, "mount -t tmpfs none /var/log && mkdir /var/log/QRV_Support /var/log/OEM_Support && " ZEP_DEBUG_SESSION
+                       " && ls /var/log/QRV_Support /var/log/OEM_Support > " +
+                           made);
+    ASSERT_EQ(std::system(("unshare --mount sh " + program).c_str()), 0);
+    std::string const listed = ReadFile(made);
+    std::string const heading = isOEM ? "/var/log/OEM_Support:\n" : "/var/log/QRV_Support:\n";
+    EXPECT_NE(listed.find(heading + "zep_0000"), std::string::npos) << listed;
+  }
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

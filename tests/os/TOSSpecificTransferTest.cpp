@@ -1,0 +1,580 @@
+// File transfer with a stand-in for libcurl (tests/os/curl): which options are set, in which order and to what, and what
+// becomes of each failure. Real servers: tests/system/transfer.
+
+#include "tests/os/HostTools.h"
+#include "tests/os/Programs.h"
+#include "tests/os/curl/StandInCurl.h"
+
+#include <dlfcn.h>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <functional>
+
+namespace NQRVZEP20 {
+namespace {
+
+namespace fs = std::filesystem;
+using testing::ElementsAre;
+using testing::ElementsAreArray;
+using testing::IsEmpty;
+using testing::StartsWith;
+using TLines = std::vector<std::string>;
+
+// While it lives, the stand-in is what "libcurl.so" names.
+class TStandIn {
+public:
+  explicit TStandIn(TCurlRecord& record, std::string const& variant = "whole")
+      : fLibrary(::dlopen(Path(variant).c_str(), RTLD_LAZY)) {
+    reinterpret_cast<TUseRecord*>(::dlsym(fLibrary, "StandInUse"))(&record);
+  }
+  ~TStandIn() { ::dlclose(fLibrary); }
+  TStandIn(TStandIn const&) = delete;
+  TStandIn& operator=(TStandIn const&) = delete;
+
+  static std::string Path(std::string const& variant) { return ZEP_CURL_DIR "/" + variant + "/libcurl.so"; }
+
+private:
+  void* fLibrary;
+};
+
+// Does something with a stand-in for libcurl, and expects that it leaves nothing behind: no descriptor, no loaded library.
+void WithStandIn(TCurlRecord& record, std::function<void()> const& work, std::string const& variant = "whole") {
+  int const descriptors = OpenDescriptors();
+  {
+    TStandIn const standIn(record, variant);
+    work();
+    EXPECT_TRUE(record.calls.empty() || record.calls.back() != "unload");
+  }
+  EXPECT_EQ(OpenDescriptors(), descriptors);
+  ASSERT_FALSE(record.calls.empty());
+  EXPECT_EQ(record.calls.back(), "unload") << "libcurl is still loaded";
+  record.calls.pop_back();
+}
+
+TLines const kStart = {"global_init 3", "easy_init", "setopt ERRORBUFFER buffer", "setopt FTP_USE_EPSV 0", "setopt PROXY ''"};
+TLines const kEnd = {"easy_cleanup", "global_cleanup"};
+
+TLines Joined(TLines a, TLines const& b, TLines const& c) {
+  a.insert(a.end(), b.begin(), b.end());
+  a.insert(a.end(), c.begin(), c.end());
+  return a;
+}
+
+class TransferTest : public testing::Test {
+protected:
+  TTempDir dir_;
+  std::string const file_ = dir_.Path("file");
+  TCurlRecord record_;
+};
+
+TEST_F(TransferTest, DownloadSetsItsOptionsInOrder) {
+  record_.chunks = {"first ", "second"};
+  record_.fileToWatch = file_;
+  TLines log;
+  WithStandIn(record_, [&] { log = LogOf([&] { TOSSpecific::CurlTransferFile("ftp://h/a b?c", file_, true); }); });
+  EXPECT_THAT(record_.calls,
+              ElementsAreArray(Joined(kStart,
+                                      {"setopt WRITEFUNCTION function", "setopt WRITEDATA context", "setopt URL 'ftp://h/a b?c'",
+                                       "setopt FTP_CREATE_MISSING_DIRS 1", "perform", "write 6 file 6", "write 6 file 12"},
+                                      kEnd)));
+  EXPECT_EQ(ReadFile(file_), "first second");
+  EXPECT_EQ(record_.errorTextAtStart, "");
+  EXPECT_THAT(log, IsEmpty());
+}
+
+TEST_F(TransferTest, UploadSetsItsOptionsInOrder) {
+  std::string const text = std::string("a\0b\r\n", 5) + std::string(100000, 'x');
+  WriteFile(file_, text);
+  TLines log;
+  WithStandIn(record_, [&] { log = LogOf([&] { TOSSpecific::CurlTransferFile("sftp://h/f", file_, false); }); });
+  EXPECT_THAT(record_.calls, ElementsAreArray(Joined(kStart,
+                                                     {"setopt UPLOAD 1", "setopt URL 'sftp://h/f'", "setopt READDATA stream",
+                                                      "setopt FTP_CREATE_MISSING_DIRS 1", "perform"},
+                                                     kEnd)));
+  EXPECT_EQ(record_.uploaded, text);
+  EXPECT_THAT(log, IsEmpty());
+}
+
+TEST_F(TransferTest, AnEmptyDownloadLeavesNoFile) {
+  WithStandIn(record_, [&] { TOSSpecific::CurlTransferFile("ftp://h/f", file_, true); });
+  EXPECT_FALSE(fs::exists(file_));
+}
+
+TEST_F(TransferTest, AnEmptyFileIsUploaded) {
+  WriteFile(file_, "");
+  WithStandIn(record_, [&] { TOSSpecific::CurlTransferFile("ftp://h/f", file_, false); });
+  EXPECT_THAT(record_.calls, testing::Contains("perform"));
+  EXPECT_EQ(record_.uploaded, "");
+}
+
+struct TRefusal {
+  int option;
+  char const* message;
+  char const* lastCall;
+};
+
+// Everything ends at the refused option: what is logged, what was called last, and that all was released.
+void ExpectRefusals(std::vector<TRefusal> const& rows, std::function<void()> const& operation) {
+  for (TRefusal const& row : rows) {
+    SCOPED_TRACE(row.message);
+    TCurlRecord record;
+    record.refusedOption = row.option;
+    TLines log;
+    WithStandIn(record, [&] { log = LogOf([&] { EXPECT_STATUS(operation(), kZEPStatusLibCurlFailure); }); });
+    EXPECT_THAT(log, ElementsAre(std::string("[Error] ") + row.message));
+    ASSERT_GE(record.calls.size(), 3u);
+    EXPECT_EQ(TLines(record.calls.end() - 2, record.calls.end()), kEnd);
+    EXPECT_EQ(*(record.calls.end() - 3), row.lastCall);
+  }
+}
+
+TEST_F(TransferTest, ARefusedOptionEndsADownload) {
+  ExpectRefusals({{10010, "TOSSpecific|CurlTransferFile: Error configuring curl error buffer", "setopt ERRORBUFFER buffer"},
+                  {85, "TOSSpecific|CurlTransferFile: Error configuring curl passive mode", "setopt FTP_USE_EPSV 0"},
+                  {10004, "TOSSpecific|CurlTransferFile: Error configuring curl proxy server", "setopt PROXY ''"},
+                  {20011, "TOSSpecific|CurlTransferFile: Error setting curl write function", "setopt WRITEFUNCTION function"},
+                  {10001, "TOSSpecific|CurlTransferFile: Error setting curl write function", "setopt WRITEDATA context"},
+                  {10002, "TOSSpecific|CurlTransferFile: Error setting curl target", "setopt URL 'ftp://h/f'"},
+                  {110, "TOSSpecific|CurlTransferFile: Error setting curl option: CURLOPT_FTP_CREATE_MISSING_DIRS",
+                   "setopt FTP_CREATE_MISSING_DIRS 1"}},
+                 [&] { TOSSpecific::CurlTransferFile("ftp://h/f", file_, true); });
+  EXPECT_FALSE(fs::exists(file_));
+}
+
+TEST_F(TransferTest, ARefusedOptionEndsAnUpload) {
+  WriteFile(file_, "text");
+  ExpectRefusals({{10010, "TOSSpecific|CurlTransferFile: Error configuring curl error buffer", "setopt ERRORBUFFER buffer"},
+                  {85, "TOSSpecific|CurlTransferFile: Error configuring curl passive mode", "setopt FTP_USE_EPSV 0"},
+                  {10004, "TOSSpecific|CurlTransferFile: Error configuring curl proxy server", "setopt PROXY ''"},
+                  {46, "TOSSpecific|CurlTransferFile: Error setting curl upload", "setopt UPLOAD 1"},
+                  {10002, "TOSSpecific|CurlTransferFile: Error setting curl target", "setopt URL 'ftp://h/f'"},
+                  {10009, "TOSSpecific|CurlTransferFile: Error setting curl upload file", "setopt READDATA stream"},
+                  {110, "TOSSpecific|CurlTransferFile: Error setting curl option: CURLOPT_FTP_CREATE_MISSING_DIRS",
+                   "setopt FTP_CREATE_MISSING_DIRS 1"}},
+                 [&] { TOSSpecific::CurlTransferFile("ftp://h/f", file_, false); });
+}
+
+TEST_F(TransferTest, WithoutAHandleNothingIsSet) {
+  record_.givesNoHandle = true;
+  TLines log;
+  WithStandIn(record_, [&] {
+    log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file_, true), kZEPStatusLibCurlFailure); });
+  });
+  EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error initalizing curl"));
+  EXPECT_THAT(record_.calls, ElementsAre("global_init 3", "easy_init", "global_cleanup"));
+}
+
+TEST_F(TransferTest, AFileThatCannotBeReadEndsAnUploadAfterTheCommonOptions) {
+  TLines log;
+  WithStandIn(record_, [&] {
+    log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file_, false), kZEPStatusLibCurlFailure); });
+  });
+  EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error getting file size"));
+  EXPECT_THAT(record_.calls, ElementsAreArray(Joined(kStart, {}, kEnd)));
+}
+
+TEST_F(TransferTest, WhatPerformGivesBecomesAStatus) {
+  struct TRow {
+    int result;
+    char const* errorText;
+    EZEPStatusCode status;
+    char const* message;
+  };
+  TRow const rows[] = {
+      {5, "Could not resolve proxy: p", kZEPStatusAccessDenied,
+       "[Error] TOSSpecific|CurlTransferFile: Error performing command: Could not resolve proxy: p"},
+      {6, "Could not resolve host: h", kZEPStatusConnectionFailed,
+       "[Error] TOSSpecific|CurlTransferFile: Error connecting to Server"},
+      {7, "Failed to connect", kZEPStatusConnectionFailed, "[Error] TOSSpecific|CurlTransferFile: Error connecting to Server"},
+      {8, "", kZEPStatusAccessDenied, "[Error] TOSSpecific|CurlTransferFile: Error performing command: "},
+      {1, "Protocol \"x\" not supported", kZEPStatusAccessDenied,
+       "[Error] TOSSpecific|CurlTransferFile: Error performing command: Protocol \"x\" not supported"},
+      {28, "server response timeout", kZEPStatusAccessDenied,
+       "[Error] TOSSpecific|CurlTransferFile: Error performing command: server response timeout"},
+      {67, "Access denied: 530", kZEPStatusAccessDenied,
+       "[Error] TOSSpecific|CurlTransferFile: Error performing command: Access denied: 530"},
+      {99, "", kZEPStatusAccessDenied, "[Error] TOSSpecific|CurlTransferFile: Error performing command: "},
+  };
+  WriteFile(dir_.Path("there"), "text");
+  for (TRow const& row : rows)
+    for (bool const download : {true, false}) {
+      SCOPED_TRACE(std::to_string(row.result) + (download ? " down" : " up"));
+      TCurlRecord record;
+      record.result = row.result;
+      record.errorText = row.errorText;
+      std::string const file = download ? file_ : dir_.Path("there");
+      TLines log;
+      WithStandIn(record, [&] {
+        log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file, download), row.status); });
+      });
+      EXPECT_THAT(log, ElementsAre(row.message));
+      EXPECT_EQ(TLines(record.calls.end() - 3, record.calls.end()), Joined({"perform"}, kEnd, {}));
+    }
+}
+
+TEST_F(TransferTest, APartOfABrokenDownloadStays) {
+  record_.chunks = {"part"};
+  record_.result = 18;
+  WithStandIn(record_, [&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file_, true), kZEPStatusAccessDenied); });
+  EXPECT_EQ(ReadFile(file_), "part");
+}
+
+// ---- Loading libcurl ----
+
+TEST_F(TransferTest, EachOfTheSixFunctionsIsNeeded) {
+  for (std::string const name : {"curl_global_init", "curl_easy_init", "curl_easy_setopt", "curl_easy_perform",
+                                 "curl_easy_cleanup", "curl_global_cleanup"}) {
+    SCOPED_TRACE(name);
+    TCurlRecord record;
+    TLines transfer, proxyCheck;
+    WithStandIn(
+        record,
+        [&] {
+          transfer =
+              LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file_, true), kZEPStatusLibCurlFailure); });
+          proxyCheck =
+              LogOf([&] { EXPECT_STATUS(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), kZEPStatusLibCurlFailure); });
+        },
+        "without_" + name);
+    std::string const reason = TStandIn::Path("without_" + name) + ": undefined symbol: " + name;
+    EXPECT_THAT(transfer, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error loading curl library: " + reason));
+    EXPECT_THAT(proxyCheck, ElementsAre("[Error] TOSSpecific|CheckProxySetting: Error loading curl library: " + reason));
+    EXPECT_THAT(record.calls, IsEmpty());
+  }
+}
+
+// The core library, and what a loader may find beside it and elsewhere.
+class LoadingCurlTest : public testing::Test {
+protected:
+  LoadingCurlTest() {
+    fs::create_directory(dir_.Path("root"));
+    fs::create_directory(dir_.Path("system"));
+    fs::copy(ZEP_LIBRARY, Root("libzepcore.so"));
+    for (char const* name : {"libcurl.so", "libcurl.so.4"}) fs::copy(kStandIn, Root(name));
+    for (char const* name : {"libcurl.so", "libcurl.so.4", "libcurl.so.3", "libcurl.so.2"}) fs::copy(kStandIn, System(name));
+  }
+
+  std::string Root(std::string const& name) const { return dir_.Path("root/" + name); }
+  std::string System(std::string const& name) const { return dir_.Path("system/" + name); }
+
+  // A file in the loader's way: it finds that one, fails, and looks no further for the name.
+  static void Spoil(std::string const& path) { WriteFile(path, ""); }
+
+  TProgramRun Probe(std::string const& arguments = "") const {
+    return RunProgram("LD_LIBRARY_PATH=" + dir_.Path("root") + ":" + dir_.Path("system") + " " ZEP_CURL_DIR "/TransferProbe " +
+                      arguments + " 2>&1");
+  }
+
+  std::string const kStandIn = TStandIn::Path("whole");
+  TTempDir dir_;
+};
+
+TEST_F(LoadingCurlTest, TheFirstThatLoadsIsUsedByEachCall) {
+  // Each stand-in names its file, once for each call.
+  struct TRow {
+    std::function<void()> prepare;
+    std::string used;
+  };
+  TRow const rows[] = {
+      {[] {}, Root("libcurl.so")},
+      {[this] { Spoil(Root("libcurl.so")); }, Root("libcurl.so.4")},
+      {[this] {
+         fs::remove(Root("libcurl.so"));
+         fs::remove(Root("libcurl.so.4"));
+       },
+       System("libcurl.so")},
+      {[this] { Spoil(System("libcurl.so")); }, System("libcurl.so.4")},
+      {[this] { Spoil(System("libcurl.so.4")); }, System("libcurl.so.3")},
+      {[this] { Spoil(System("libcurl.so.3")); }, System("libcurl.so.2")},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.used);
+    row.prepare();
+    TProgramRun const run = Probe();
+    EXPECT_EQ(run.output, row.used + "\ndone\n" + row.used + "\ndone\n");
+    EXPECT_EQ(run.exitCode, 0);
+  }
+}
+
+TEST_F(LoadingCurlTest, WithoutOneEachCallTriesEveryNameAgain) {
+  fs::remove(Root("libcurl.so"));
+  fs::remove(Root("libcurl.so.4"));
+  fs::remove(System("libcurl.so.2"));
+  for (char const* name : {"libcurl.so", "libcurl.so.4", "libcurl.so.3"}) Spoil(System(name));
+  std::string const failure =
+      "kZEPStatusLibCurlFailure\n"
+      "TOSSpecific|CurlTransferFile: Error opening curl library: "
+      "libcurl.so.2: cannot open shared object file: No such file or directory\n";
+  EXPECT_EQ(Probe().output, failure + failure);
+  // One that comes between the two calls is found by the second.
+  std::string const late = Root("libcurl.so.4");
+  EXPECT_EQ(Probe(kStandIn + " " + late).output, failure + late + "\ndone\n");
+}
+
+// ---- The write callback ----
+
+TEST_F(TransferTest, WriteCallbackAppendsAndCloses) {
+  TCurlWriteContext context{file_, nullptr};
+  int const descriptors = OpenDescriptors();
+  char first[] = "abcd", second[] = "efghij";
+  EXPECT_EQ(curl_fwrite(first, 1, 4, &context), 4u);
+  EXPECT_EQ(context.fStream, nullptr);
+  EXPECT_EQ(curl_fwrite(second, 3, 2, &context), 2u) << "items, not bytes";
+  EXPECT_EQ(curl_fwrite(second, 1, 0, &context), 0u);
+  EXPECT_EQ(curl_fwrite(second, 0, 5, &context), 0u);
+  EXPECT_EQ(ReadFile(file_), "abcdefghij");
+  EXPECT_EQ(OpenDescriptors(), descriptors);
+}
+
+TEST_F(TransferTest, WriteCallbackRefusesWithoutContextPathOrFile) {
+  char data[] = "abcd";
+  TCurlWriteContext noPath{"", nullptr}, noDirectory{dir_.Path("no/file"), nullptr}, directory{dir_.Path(), nullptr};
+  EXPECT_EQ(curl_fwrite(data, 1, 4, nullptr), 0xFFFFFFFFu);
+  EXPECT_EQ(curl_fwrite(data, 1, 4, &noPath), 0xFFFFFFFFu);
+  EXPECT_EQ(curl_fwrite(data, 1, 4, &noDirectory), 0xFFFFFFFFu);
+  EXPECT_EQ(curl_fwrite(data, 1, 4, &directory), 0xFFFFFFFFu);
+}
+
+TEST_F(TransferTest, AChunkThatDoesNotGetToTheDiskIsNotWritten) {
+  TCurlWriteContext context{"/dev/full", nullptr};
+  for (unsigned long const size : {1ul, 100ul, 4096ul, 16384ul, 16385ul}) {
+    SCOPED_TRACE(size);
+    std::string data(size, 'x');
+    EXPECT_LT(curl_fwrite(data.data(), 1, size, &context), size);
+  }
+}
+
+TEST_F(TransferTest, ADownloadEndsAtTheFirstChunkThatIsRefused) {
+  record_.chunks = {"one", "two"};
+  WithStandIn(record_, [&] {
+    EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", dir_.Path("no/file"), true), kZEPStatusAccessDenied);
+  });
+  EXPECT_THAT(record_.calls, testing::Contains("write 4294967295").Times(1));
+}
+
+// ---- A local file in the way of a download ----
+
+// Downloads onto the file in a process that has the input as its standard input: everything that it printed, and then the
+// calls of libcurl in a line each.
+std::string DownloadOnto(std::string const& file, std::string const& input, TTempDir const& dir) {
+  WriteFile(dir.Path("input"), input);
+  return InChild([&] {
+    TCurlRecord record;
+    record.chunks = {"new"};
+    if (std::freopen(dir.Path("input").c_str(), "r", stdin) == nullptr) return std::string("no input");
+    if (std::freopen(dir.Path("output").c_str(), "w", stdout) == nullptr) return std::string("no output");
+    {
+      TStandIn const standIn(record);
+      TOSSpecific::CurlTransferFile("ftp://h/f", file, true);
+    }
+    std::fflush(stdout);
+    std::string text = ReadFile(dir.Path("output"));
+    for (std::string const& call : record.calls) text += "\n" + call;
+    return text;
+  });
+}
+
+std::string const kQuestion = "Local file exists, overwrite it anyway?(y/n): ";
+std::string const kQuietEnd =
+    "\nglobal_init 3\neasy_init\nsetopt ERRORBUFFER buffer\nsetopt FTP_USE_EPSV 0\nsetopt PROXY ''\neasy_cleanup\nglobal_cleanup"
+    "\nunload";
+
+std::string Repeated(std::string const& text, int times) {
+  std::string all;
+  while (times-- > 0) all += text;
+  return all;
+}
+
+TEST_F(TransferTest, ALocalFileIsOverwrittenWhenTheAnswerIsY) {
+  struct TRow {
+    char const* input;
+    int questions;
+    bool isOverwritten;
+  };
+  TRow const rows[] = {
+      {"y\n", 1, true},       {"Y\n", 1, true},       {"y", 1, true},  // without an end of line
+      {"n\n", 1, false},      {"N\n", 1, false},      {"\n\ny\n", 3, true},
+      {"yes\ny\n", 2, true},  {"yes\nn\n", 2, false}, {"no\n y\ny \nYY\n1\nN\n", 6, false},
+      {"y\r\nn\n", 2, false}, {"n\ny\n", 1, false},   {"", 1, false},  // the end of the input counts as "n"
+      {"yes\n", 2, false},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(testing::PrintToString(row.input));
+    WriteFile(file_, "old and longer");
+    std::string const output = DownloadOnto(file_, row.input, dir_);
+    std::string const questions = Repeated(kQuestion, row.questions);
+    if (row.isOverwritten) {
+      EXPECT_THAT(output, StartsWith(questions + "\nglobal_init 3\n"));
+      EXPECT_THAT(output, testing::HasSubstr("\nperform\n"));
+      EXPECT_EQ(ReadFile(file_), "new");
+    } else {
+      EXPECT_EQ(output, questions + kQuietEnd);
+      EXPECT_EQ(ReadFile(file_), "old and longer");
+    }
+  }
+}
+
+TEST_F(TransferTest, ALocalFileThatCannotBeDeletedEndsQuietly) {
+  // A directory opens for reading and is nothing that can be unlinked, not even by root.
+  fs::create_directory(file_);
+  EXPECT_EQ(DownloadOnto(file_, "y\n", dir_), kQuestion + "Permission denied.\n" + kQuietEnd);
+  EXPECT_TRUE(fs::is_directory(file_));
+}
+
+TEST_F(TransferTest, ALocalFileThatCannotBeReadIsNotAskedAbout) {
+  WriteFile(file_, "old");
+  fs::permissions(file_, fs::perms::owner_write | fs::perms::others_write);
+  fs::permissions(dir_.Path(), fs::perms::all);
+  NEEDS(InChild([] { return BecomeUnprivileged() ? "yes" : "no"; }) == "yes", "a user without privileges");
+  std::string const text = InChild([&] {
+    TCurlRecord record;
+    record.chunks = {"new"};
+    TStandIn const standIn(record);
+    if (!BecomeUnprivileged()) return std::string("still privileged");
+    if (::freopen("/dev/null", "r", stdin) == nullptr) return std::string("no input");
+    TOSSpecific::CurlTransferFile("ftp://h/f", file_, true);
+    return std::string("no question");
+  });
+  EXPECT_EQ(text, "no question");
+  EXPECT_EQ(ReadFile(file_), "oldnew") << "the download is appended";
+}
+
+// ---- The operations that make the URL ----
+
+TEST_F(TransferTest, UrlsAreMadeOfHostAndName) {
+  WriteFile(file_, "text");
+  std::string const upload = "hostline/toqrv/vantor/fdr_upload/";
+  struct TRow {
+    char const* isBootable;
+    std::string prefix;
+  };
+  TRow const rows[] = {{nullptr, ""}, {"no", ""}, {"", ""}, {"YES", ""}, {"Yes", ""}, {"yes ", ""}, {"yes", upload}};
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.isBootable ? row.isBootable : "not set");
+    TEnvironmentGuard const guard("ZEP_ISBOOTABLE", row.isBootable);
+    std::string const absent = dir_.Path("absent");
+    struct TOperation {
+      std::function<void()> call;
+      std::string url, uploaded;
+    };
+    TOperation const operations[] = {
+        {[&] { TOSSpecific::FTPFile("h:21", file_, "d/n"); }, "ftp://h:21/" + row.prefix + "d/n", "text"},
+        {[&] { TOSSpecific::sFTPFile("h", file_, "d/n"); }, "sftp://h/" + row.prefix + "d/n", "text"},
+        {[&] { TOSSpecific::UserFTPFile("h", file_, "n"); }, "ftp://h/n.xml.gz", "text"},
+        {[&] { TOSSpecific::FTPFileFromQRV("h", absent, "d/n"); }, "ftp://h/d/n", ""},
+        {[&] { TOSSpecific::sFTPFileFromQRV("u:p@h", absent, "n"); }, "sftp://u:p@h/n", ""},
+    };
+    for (TOperation const& operation : operations) {
+      TCurlRecord record;
+      WithStandIn(record, operation.call);
+      EXPECT_THAT(record.calls, testing::Contains("setopt URL '" + operation.url + "'"));
+      EXPECT_EQ(record.uploaded, operation.uploaded) << operation.url;
+    }
+  }
+}
+
+TEST_F(TransferTest, UserUploadNamesTheRemoteFileFirst) {
+  TCurlRecord record;
+  testing::internal::CaptureStdout();
+  WithStandIn(record, [&] { EXPECT_STATUS(TOSSpecific::UserFTPFile("h", file_, "nightly"), kZEPStatusLibCurlFailure); });
+  EXPECT_EQ(testing::internal::GetCapturedStdout(), "Remote file name = nightly.xml.gz\n");
+}
+
+TEST_F(TransferTest, WhatATransferThrowsPassesThrough) {
+  WriteFile(file_, "text");
+  for (auto const& operation : std::vector<std::function<void()>>{
+           [&] { TOSSpecific::FTPFile("h", file_, "n"); }, [&] { TOSSpecific::sFTPFile("h", file_, "n"); },
+           [&] { TOSSpecific::FTPFileFromQRV("h", dir_.Path("a"), "n"); },
+           [&] { TOSSpecific::sFTPFileFromQRV("h", dir_.Path("a"), "n"); }, [&] { TOSSpecific::UserFTPFile("h", file_, "n"); }}) {
+    TCurlRecord record;
+    record.result = 7;
+    WithStandIn(record, [&] { EXPECT_STATUS(operation(), kZEPStatusConnectionFailed); });
+  }
+}
+
+// ---- The proxy check ----
+
+class ProxyCheckTest : public TransferTest {
+protected:
+  TWorkingDirectory const work_{dir_.Path()};
+};
+
+TEST_F(ProxyCheckTest, SetsItsOptionsInOrder) {
+  record_.chunks = {"<html>", "</html>"};
+  record_.fileToWatch = dir_.Path("content.html");
+  TLines log;
+  WithStandIn(record_, [&] {
+    log = LogOf([&] { EXPECT_EQ(TOSSpecific::CheckProxySetting("10.0.0.1", "8080", "u:p", 5), kZEPStatusOK); });
+  });
+  EXPECT_THAT(record_.calls, ElementsAre("global_init 3", "easy_init", "setopt ERRORBUFFER buffer", "setopt PROXY '10.0.0.1'",
+                                         "setopt PROXYPORT 8080", "setopt URL 'http://www.example.com/'",
+                                         "setopt WRITEFUNCTION function", "setopt WRITEDATA context", "setopt PROXYUSERPWD 'u:p'",
+                                         "perform", "write 6 file 6", "write 7 file 13", "easy_cleanup", "global_cleanup"));
+  EXPECT_EQ(ReadFile(dir_.Path("content.html")), "<html></html>");
+  EXPECT_THAT(log, IsEmpty());
+}
+
+TEST_F(ProxyCheckTest, ARefusedOptionEndsIt) {
+  ExpectRefusals({{10010, "TOSSpecific|CheckProxySetting: Error configuring curl error buffer", "setopt ERRORBUFFER buffer"},
+                  {10004, "TOSSpecific|CheckProxySetting: Error setting proxyIp", "setopt PROXY 'p'"},
+                  {59, "TOSSpecific|CheckProxySetting: Error setting proxyPort", "setopt PROXYPORT 1"},
+                  {10002, "TOSSpecific|CheckProxySetting: Error setting URL", "setopt URL 'http://www.example.com/'"},
+                  {20011, "TOSSpecific|CurlTransferFile: Error setting curl write function", "setopt WRITEFUNCTION function"},
+                  {10001, "TOSSpecific|CurlTransferFile: Error setting curl write function", "setopt WRITEDATA context"},
+                  {10006, "TOSSpecific|CheckProxySetting: Error setting userId & passwd", "setopt PROXYUSERPWD 'u:p'"}},
+                 [] { TOSSpecific::CheckProxySetting("p", "1", "u:p", 0); });
+}
+
+TEST_F(ProxyCheckTest, WithoutAHandleNothingIsSet) {
+  record_.givesNoHandle = true;
+  TLines log;
+  WithStandIn(record_, [&] {
+    log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), kZEPStatusLibCurlFailure); });
+  });
+  EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CheckProxySetting: Error initalizing curl"));
+}
+
+TEST_F(ProxyCheckTest, AFailedPerformIsLoggedAndReturned) {
+  struct TRow {
+    int result;
+    EZEPStatusCode status;
+  };
+  for (TRow const& row : {TRow{5, kZEPStatusConnectionFailed}, TRow{7, kZEPStatusConnectionFailed},
+                          TRow{56, kZEPStatusAccessDenied}, TRow{23, kZEPStatusAccessDenied}}) {
+    SCOPED_TRACE(row.result);
+    TCurlRecord record;
+    record.result = row.result;
+    record.errorText = "the reason";
+    TLines log;
+    WithStandIn(record, [&] { log = LogOf([&] { EXPECT_EQ(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), row.status); }); });
+    EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CheckProxySetting: curl_easy_perform FAILed;the reason"));
+    EXPECT_EQ(TLines(record.calls.end() - 3, record.calls.end()), Joined({"perform"}, kEnd, {}));
+  }
+}
+
+TEST_F(ProxyCheckTest, APortThatIsNoNumberIsNone) {
+  WithStandIn(record_, [] { TOSSpecific::CheckProxySetting("p", "many", "", 0); });
+  EXPECT_THAT(record_.calls, testing::IsSupersetOf({"setopt PROXYPORT 0", "setopt PROXYUSERPWD ''"}));
+}
+
+// ---- The host name ----
+
+TEST(DetectHostnameTest, ZeroMeansAvailable) {
+  int result = -1;
+  EXPECT_THAT(LogOf([&] { result = TOSSpecific::DetectHostnameAvailable("localhost", "ignored"); }),
+              ElementsAre("[Debug] TOSSpecific debug output: Network is ok."));
+  EXPECT_EQ(result, 0);
+  EXPECT_EQ(TOSSpecific::DetectHostnameAvailable("127.0.0.1", ""), 0);
+}
+
+TEST(DetectHostnameTest, OneMeansUnavailable) {
+  int result = -1;
+  EXPECT_THAT(LogOf([&] { result = TOSSpecific::DetectHostnameAvailable("no host has blanks", ""); }),
+              ElementsAre("[Debug] TOSSpecific debug output: Network is unavailable."));
+  EXPECT_EQ(result, 1);
+  EXPECT_EQ(TOSSpecific::DetectHostnameAvailable("", ""), 1);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

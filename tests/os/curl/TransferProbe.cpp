@@ -1,0 +1,30 @@
+// Downloads twice with the library and the libcurl that it is led to, and tells what came of it.
+//
+//   TransferProbe [FROM TO]      links TO to the file FROM between the two
+
+#include "TOSSpecific.h"
+#include "TZEPException.h"
+#include "tests/Support.h"
+
+#include <unistd.h>
+
+#include <cstdio>
+
+using namespace NQRVZEP20;
+
+static void Try() {
+  try {
+    TOSSpecific::CurlTransferFile("ftp://127.0.0.1/x", "no/such/file", true);
+    std::puts("done");
+  } catch (TZEPException const& failure) {
+    std::puts(failure.what());
+  }
+  for (std::string const& message : LoggedMessages()) std::puts(message.c_str());
+  TRootObject::GetCoreLogger()->ClearLog();
+}
+
+int main(int argc, char** argv) {
+  Try();
+  if (argc == 3 && ::symlink(argv[1], argv[2]) != 0) return 1;
+  Try();
+}

@@ -1,0 +1,5 @@
+// Starts a debug session where the library wants its file.
+
+#include "TOSSpecific.h"
+
+int main() { return NQRVZEP20::TOSSpecific::SetDebugLevel(3, nullptr) ? 0 : 1; }

@@ -1,0 +1,157 @@
+#include "tests/system/ipmi/IpmiBed.h"
+
+#include <arpa/inet.h>
+#include <fcntl.h>
+#include <net/if.h>
+#include <poll.h>
+#include <sched.h>
+#include <sys/ioctl.h>
+#include <sys/prctl.h>
+#include <sys/socket.h>
+#include <sys/wait.h>
+
+#include <csignal>
+#include <cstring>
+
+namespace NQRVZEP20 {
+namespace {
+
+bool IsOnPath(std::string const& program) { return std::system(("command -v " + program + " >/dev/null 2>&1").c_str()) == 0; }
+
+sockaddr_in Loopback(int port) {
+  sockaddr_in address{};
+  address.sin_family = AF_INET;
+  address.sin_port = htons(static_cast<std::uint16_t>(port));
+  address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+  return address;
+}
+
+bool IsReadable(int fd, int milliseconds) {
+  pollfd polled = {fd, POLLIN, 0};
+  return ::poll(&polled, 1, milliseconds) > 0;
+}
+
+std::string Receive(int fd, sockaddr_in* from) {
+  std::string datagram(2048, '\0');
+  socklen_t size = sizeof *from;
+  ssize_t const got =
+      ::recvfrom(fd, datagram.data(), datagram.size(), 0, reinterpret_cast<sockaddr*>(from), from ? &size : nullptr);
+  datagram.resize(got > 0 ? static_cast<std::size_t>(got) : 0);
+  return datagram;
+}
+
+}  // namespace
+
+bool HasIpmiBed() { return ::geteuid() == 0 && IsOnPath("ipmi_sim"); }
+
+void EnterNetworkNamespace() {
+  if (::unshare(CLONE_NEWNET) != 0) throw std::runtime_error("no network namespace");
+  TUniqueFd const socket(::socket(AF_INET, SOCK_DGRAM, 0));
+  ifreq request{};
+  std::strcpy(request.ifr_name, "lo");
+  request.ifr_flags = IFF_UP | IFF_RUNNING;
+  if (::ioctl(socket.get(), SIOCSIFFLAGS, &request) != 0) throw std::runtime_error("loopback does not come up");
+}
+
+// ---- The simulator ----
+
+TSimulator::TSimulator(TSettings const& settings) {
+  int ends[2];
+  if (::pipe2(ends, O_CLOEXEC) != 0) throw std::runtime_error("no pipe");
+  fOutput.reset(ends[0]);
+  TUniqueFd const output(ends[1]);
+  std::string const port = std::to_string(settings.port);
+  std::vector<char const*> arguments = {ZEP_IPMI_SIM_START,     "--addr",   settings.address.c_str(),     "--model",
+                                        settings.model.c_str(), "--serial", settings.serialNumber.c_str()};
+  if (!settings.fru.empty()) arguments.insert(arguments.end(), {"--fru", settings.fru.c_str()});
+  arguments.insert(arguments.end(), {port.c_str(), nullptr});
+  fScript = ::fork();
+  if (fScript == 0) {
+    ::prctl(PR_SET_PDEATHSIG, SIGTERM);
+    ::dup2(output.get(), STDOUT_FILENO);
+    ::execv(arguments[0], const_cast<char**>(arguments.data()));
+    ::_exit(127);
+  }
+}
+
+TSimulator::~TSimulator() {
+  if (fSimulator > 0) GoOn();  // else it could not end
+  ::kill(fScript, SIGTERM);
+  ::waitpid(fScript, nullptr, 0);
+}
+
+void TSimulator::WaitUntilReady() {
+  std::string line;
+  constexpr int kLongestMilliseconds = 20000;
+  for (char byte; IsReadable(fOutput.get(), kLongestMilliseconds) && ::read(fOutput.get(), &byte, 1) == 1 && byte != '\n';)
+    line += byte;
+  if (std::sscanf(line.c_str(), "ready pid %d", &fSimulator) != 1)
+    throw std::runtime_error("the simulator did not come up: " + line);
+}
+
+void TSimulator::Stop() const { ::kill(fSimulator, SIGSTOP); }
+void TSimulator::GoOn() const { ::kill(fSimulator, SIGCONT); }
+
+// ---- Peers that misbehave ----
+
+TUdpPeer::TUdpPeer(int port, TAnswer answer) : fSocket(::socket(AF_INET, SOCK_DGRAM, 0)), fAnswer(std::move(answer)) {
+  sockaddr_in const address = Loopback(port);
+  if (::bind(fSocket.get(), reinterpret_cast<sockaddr const*>(&address), sizeof address) != 0)
+    throw std::runtime_error("port in use");
+  fThread = std::thread([this] { Run(); });
+}
+
+TUdpPeer::~TUdpPeer() {
+  fEnds = true;
+  fThread.join();
+}
+
+void TUdpPeer::Run() {
+  while (!fEnds) {
+    if (!IsReadable(fSocket.get(), 20)) continue;
+    sockaddr_in from{};
+    std::string const datagram = Receive(fSocket.get(), &from);
+    ++fReceived;
+    if (auto const answer = fAnswer(datagram))
+      ::sendto(fSocket.get(), answer->data(), answer->size(), 0, reinterpret_cast<sockaddr*>(&from), sizeof from);
+  }
+}
+
+std::optional<std::string> AskOf(int port, std::string const& datagram) {
+  // One source address for all that is asked, as a session has.
+  static TUniqueFd const socket(::socket(AF_INET, SOCK_DGRAM, 0));
+  sockaddr_in const address = Loopback(port);
+  ::sendto(socket.get(), datagram.data(), datagram.size(), 0, reinterpret_cast<sockaddr const*>(&address), sizeof address);
+  if (!IsReadable(socket.get(), 300)) return std::nullopt;
+  sockaddr_in from{};
+  return Receive(socket.get(), &from);
+}
+
+// ---- The platform library ----
+
+TIpmiClientLibrary::TIpmiClientLibrary() {
+  void* const library = ::dlopen(ZEP_BUILD_DIR "/lib/libipmiClient.so", RTLD_NOW);
+  if (library == nullptr) throw std::runtime_error(::dlerror());
+  open = FunctionOf<decltype(OpenConnection)>(library, "OpenConnection");
+  send = FunctionOf<decltype(SendIpmiCommand)>(library, "SendIpmiCommand");
+  close = FunctionOf<decltype(CloseConnection)>(library, "CloseConnection");
+}
+
+int TIpmiClientLibrary::Open(int port, char const* host) const {
+  return open(kIpmiClientLan, host, std::to_string(port).c_str(), "zepadmin", "zeppass1");
+}
+
+TIpmiClientLibrary::TRead TIpmiClientLibrary::ReadFru(unsigned offset, unsigned char count, unsigned char device) const {
+  unsigned char const request[] = {device, static_cast<unsigned char>(offset & 0xFF), static_cast<unsigned char>(offset >> 8),
+                                   count};
+  unsigned char response[kIpmiClientResponseSize];
+  unsigned short length = 0;
+  unsigned char completionCode = 0xFF;
+  TRead read;
+  read.result = send(0x11, request, sizeof request, response, &length, &completionCode, 0x0A);
+  read.completionCode = completionCode;
+  read.data.assign(reinterpret_cast<char const*>(response), length);
+  return read;
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,97 @@
+#pragma once
+
+// Management controllers for tests: the simulator ipmi_sim on addresses of a network namespace, peers that misbehave, and
+// the platform library that talks to them.
+
+#include "core/Handles.h"
+#include "platform/include/ipmiClient.h"
+#include "tests/Support.h"
+
+#include <atomic>
+#include <optional>
+
+namespace NQRVZEP20 {
+
+// Whether the simulator is installed and this user may make network namespaces. A test that needs more than loopback's high
+// ports calls EnterNetworkNamespace first.
+bool HasIpmiBed();
+inline constexpr char const* kIpmiBedNeeds = "ipmi_sim (package openipmi), and root";
+
+// Moves the calling thread, and the processes that it starts, into a network of its own in which only loopback is up. For
+// the rest of the process.
+void EnterNetworkNamespace();
+
+// A simulated controller; ended with the object. Its account is zepadmin with the password zeppass1, its FRU data holds the
+// given texts.
+class TSimulator {
+public:
+  struct TSettings {
+    std::string address = "127.0.0.1";
+    int port = 623;
+    std::string model = "1234AB7";
+    std::string serialNumber = "KQ12345";
+    std::string fru = {};  // a whole FRU image instead of the two
+  };
+
+  explicit TSimulator(TSettings const& settings);
+  ~TSimulator();
+  TSimulator(TSimulator const&) = delete;
+  TSimulator& operator=(TSimulator const&) = delete;
+
+  // It starts in the background: waits until it listens. To be called before it is used.
+  void WaitUntilReady();
+
+  void Stop() const;  // it receives nothing until it goes on
+  void GoOn() const;
+
+private:
+  int fScript;         // process id of the script that runs it
+  int fSimulator = 0;  // process id of the simulator, once it is ready
+  TUniqueFd fOutput;
+};
+
+// Receives the datagrams of a UDP port of 127.0.0.1 on a thread of its own and hands them to a function, whose result, if
+// any, is sent back.
+class TUdpPeer {
+public:
+  using TAnswer = std::function<std::optional<std::string>(std::string const&)>;
+
+  TUdpPeer(int port, TAnswer answer);
+  ~TUdpPeer();
+
+  int Received() const { return fReceived; }
+
+private:
+  void Run();
+
+  TUniqueFd fSocket;
+  TAnswer fAnswer;
+  std::atomic<int> fReceived{0};
+  std::atomic<bool> fEnds{false};
+  std::thread fThread;
+};
+
+// Sends a datagram on to the controller at 127.0.0.1 and that port and returns its answer.
+std::optional<std::string> AskOf(int port, std::string const& datagram);
+
+// libipmiClient.so of the build, loaded as the core loads it.
+struct TIpmiClientLibrary {
+  TIpmiClientLibrary();
+
+  decltype(&OpenConnection) open;
+  decltype(&SendIpmiCommand) send;
+  decltype(&CloseConnection) close;
+
+  // Opens as zepadmin.
+  int Open(int port, char const* host = "127.0.0.1") const;
+
+  // Reads FRU data of device 0.
+  struct TRead {
+    int result;
+    int completionCode;
+    std::string data;  // the count and what follows
+  };
+  TRead ReadFru(unsigned offset, unsigned char count, unsigned char device = 0) const;
+};
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,258 @@
+// libipmiClient.so against simulated controllers.
+
+#include "tests/system/ipmi/IpmiBed.h"
+
+#include <gtest/gtest.h>
+
+#include <chrono>
+#include <random>
+
+namespace NQRVZEP20 {
+namespace {
+
+using namespace std::string_literals;
+using TClock = std::chrono::steady_clock;
+
+double SecondsSince(TClock::time_point start) { return std::chrono::duration<double>(TClock::now() - start).count(); }
+
+class IpmiClientTest : public testing::Test {
+protected:
+  void SetUp() override {
+    NEEDS(HasIpmiBed(), kIpmiBedNeeds);
+    EnterNetworkNamespace();
+  }
+  void TearDown() override { client_.close(); }
+
+  TSimulator& Start(TSimulator::TSettings const& settings = {}) {
+    simulator_.reset();
+    simulator_.emplace(settings);
+    simulator_->WaitUntilReady();
+    return *simulator_;
+  }
+
+  TIpmiClientLibrary const client_;
+  std::optional<TSimulator> simulator_;
+};
+
+TEST_F(IpmiClientTest, ReadsFruData) {
+  Start();
+  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  auto const read = client_.ReadFru(0x1AC, 0x1E);
+  EXPECT_EQ(read.result, kIpmiClientOk);
+  EXPECT_EQ(read.completionCode, 0);
+  EXPECT_EQ(read.data,
+            "\x1E"
+            "1234AB7\0"s +
+                std::string(22, ' '));
+  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+}
+
+TEST_F(IpmiClientTest, ARefusedCommandTellsWhy) {
+  Start();
+  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  struct TRow {
+    char const* what;
+    unsigned offset;
+    unsigned char device;
+    int completionCode;
+  };
+  TRow const rows[] = {{"an offset behind the data", 0x7000, 0, 0xC9}, {"no such device", 0, 9, 0xCC}};
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.what);
+    auto const read = client_.ReadFru(row.offset, 7, row.device);
+    EXPECT_EQ(read.result, kIpmiClientCompletionCode);
+    EXPECT_NE(read.completionCode, 0);
+    EXPECT_NE(read.completionCode, 0xFF);
+    EXPECT_EQ(read.data, "");
+  }
+  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345") << "the session goes on";
+}
+
+TEST_F(IpmiClientTest, AnAnswerMayBeShorterThanAskedFor) {
+  Start();
+  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  EXPECT_EQ(client_.ReadFru(1024 - 3, 0x1E).data, "\x03\xFF\xFF\xFF");
+}
+
+TEST_F(IpmiClientTest, EachReasonNotToOpenHasItsCode) {
+  Start();
+  struct TRow {
+    char const* what;
+    char const *host, *port, *user, *password;
+    int result;
+    double longestSeconds;
+  };
+  std::string const tooLong(21, 'x');
+  TRow const rows[] = {
+      {"wrong password", "127.0.0.1", "623", "zepadmin", "wrong", kIpmiClientWrongPassword, 1},
+      {"empty password", "127.0.0.1", "623", "zepadmin", "", kIpmiClientWrongPassword, 1},
+      {"unknown user", "127.0.0.1", "623", "nobody", "zeppass1", kIpmiClientUnknownUser, 1},
+      {"disabled user", "127.0.0.1", "623", "zepoff", "offpass", kIpmiClientUnknownUser, 1},
+      {"nobody listens", "127.0.0.1", "624", "zepadmin", "zeppass1", kIpmiClientNoAnswer, 6.5},
+      {"no route", "192.0.2.1", "623", "zepadmin", "zeppass1", kIpmiClientUnreachable, 1},
+      {"no such host", "no such host", "623", "zepadmin", "zeppass1", kIpmiClientHostUnknown, 6.5},
+      {"no host", "", "623", "zepadmin", "zeppass1", kIpmiClientHostUnknown, 1},
+      {"a password that is too long", "127.0.0.1", "623", "zepadmin", tooLong.c_str(), kIpmiClientBadArgument, 1},
+      {"null host", nullptr, "623", "zepadmin", "zeppass1", kIpmiClientBadArgument, 1},
+      {"null port", "127.0.0.1", nullptr, "zepadmin", "zeppass1", kIpmiClientBadArgument, 1},
+      {"null user", "127.0.0.1", "623", nullptr, "zeppass1", kIpmiClientBadArgument, 1},
+      {"null password", "127.0.0.1", "623", "zepadmin", nullptr, kIpmiClientBadArgument, 1},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.what);
+    auto const start = TClock::now();
+    EXPECT_EQ(client_.open(kIpmiClientLan, row.host, row.port, row.user, row.password), row.result);
+    EXPECT_LT(SecondsSince(start), row.longestSeconds);
+    EXPECT_EQ(client_.ReadFru(0, 1).result, kIpmiClientNoSession);
+  }
+  for (int mode : {0, 1, 2, 4, -1})
+    EXPECT_EQ(client_.open(mode, "127.0.0.1", "623", "zepadmin", "zeppass1"), kIpmiClientBadArgument) << mode;
+}
+
+TEST_F(IpmiClientTest, OtherAccountsOpenAsWell) {
+  Start();
+  EXPECT_EQ(client_.open(kIpmiClientLan, "localhost", "623", "zep16", "abcdefghijklmnop"), kIpmiClientOk);
+  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+}
+
+TEST_F(IpmiClientTest, ASilentControllerIsGivenUpAfterAbout5Seconds) {
+  TUdpPeer silent(623, [](std::string const&) { return std::nullopt; });
+  auto const start = TClock::now();
+  EXPECT_EQ(client_.Open(623), kIpmiClientNoAnswer);
+  EXPECT_GT(SecondsSince(start), 3);
+  EXPECT_LT(SecondsSince(start), 6.5);
+  EXPECT_GT(silent.Received(), 1) << "it should have been asked more than once";
+}
+
+TEST_F(IpmiClientTest, GarbageIsNoSession) {
+  std::mt19937 random(5);
+  TUdpPeer garbage(623, [&](std::string const&) {
+    std::string bytes(random() % 80, '\0');
+    for (char& byte : bytes) byte = static_cast<char>(random());
+    if (bytes.size() > 3 && random() % 2 == 0) bytes.replace(0, 4, "\x06\0\xFF\x07"s);  // looks like RMCP
+    return bytes;
+  });
+  auto const start = TClock::now();
+  EXPECT_NE(client_.Open(623), kIpmiClientOk);
+  EXPECT_LT(SecondsSince(start), 10);
+  EXPECT_GT(garbage.Received(), 0);
+}
+
+TEST_F(IpmiClientTest, AMangledAnswerIsNeverTakenForTheTruth) {
+  Start({"127.0.0.1", 6240});
+  std::mt19937 random(6);
+  TUdpPeer mangler(623, [&](std::string const& datagram) {
+    auto answer = AskOf(6240, datagram);
+    if (answer && !answer->empty()) (*answer)[random() % answer->size()] ^= static_cast<char>(1 + random() % 255);
+    return answer;
+  });
+  for (int round = 0; round < 3; ++round) {
+    auto const start = TClock::now();
+    client_.Open(623);
+    std::string const data = client_.ReadFru(0x1CC, 7).data;
+    EXPECT_TRUE(data == "" || data == "\x07KQ12345") << data;
+    EXPECT_LT(SecondsSince(start), 20);
+  }
+  EXPECT_GT(mangler.Received(), 3);
+}
+
+TEST_F(IpmiClientTest, OpeningClosesTheSessionBefore) {
+  Start();
+  // The simulator has room for 63 sessions.
+  for (int round = 0; round < 70; ++round) ASSERT_EQ(client_.Open(623), kIpmiClientOk) << round;
+  EXPECT_EQ(client_.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "wrong"), kIpmiClientWrongPassword);
+  EXPECT_EQ(client_.ReadFru(0, 1).result, kIpmiClientNoSession) << "also when opening fails";
+}
+
+TEST_F(IpmiClientTest, ClosingEndsTheSession) {
+  Start();
+  EXPECT_EQ(client_.close(), 0) << "also without one";
+  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  EXPECT_EQ(client_.close(), 0);
+  EXPECT_EQ(client_.ReadFru(0, 1).result, kIpmiClientNoSession);
+  EXPECT_EQ(client_.close(), 0);
+}
+
+TEST_F(IpmiClientTest, ArgumentsThatCannotBeUsedAreRefused) {
+  Start();
+  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  unsigned char bytes[256] = {};
+  unsigned short length = 0;
+  unsigned char code = 0xFF;
+  EXPECT_EQ(client_.send(1, nullptr, 1, bytes, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(client_.send(1, bytes, -1, bytes, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(client_.send(1, bytes, 256, bytes, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(client_.send(1, bytes, 0, nullptr, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(client_.send(1, bytes, 0, bytes, nullptr, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(client_.send(1, bytes, 0, bytes, &length, nullptr, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(client_.send(1, nullptr, 0, bytes, &length, &code, 6), kIpmiClientOk) << "Get Device ID has no data";
+  EXPECT_GT(length, 10);
+}
+
+// A session in which nothing was asked for longer than its time-out.
+TEST_F(IpmiClientTest, ASessionThatHasExpiredIsOpenedAgain) {
+  Start();
+  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  std::this_thread::sleep_for(std::chrono::milliseconds(4300));
+  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+}
+
+TEST_F(IpmiClientTest, AControllerStoppedInMidSessionGivesNoAnswerAndComesBack) {
+  TSimulator const& simulator = Start();
+  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  ASSERT_EQ(client_.ReadFru(0x1CC, 7).result, kIpmiClientOk);
+  simulator.Stop();
+  auto const start = TClock::now();
+  EXPECT_EQ(client_.ReadFru(0x1CC, 7).result, kIpmiClientNoAnswer);
+  EXPECT_LT(SecondsSince(start), 13) << "once in the session, once to open another";
+  simulator.GoOn();
+  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345") << "the next command tries again";
+}
+
+TEST_F(IpmiClientTest, AControllerThatForgotTheSessionIsAskedInAnother) {
+  Start();
+  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  Start({"127.0.0.1", 623, "1234AB7", "ANOTHER"});
+  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data,
+            "\x07"
+            "ANOTHER");
+}
+
+// ---- A controller that speaks 1.5 only ----
+
+// Takes version 2.0 out of the answer to Get Channel Authentication Capabilities.
+std::string WithoutVersion2(std::string answer) {
+  constexpr std::size_t kAuthenticationTypeInHeader = 4, kMessage = 14, kCommand = 19, kTypes = 22, kExtended = 24;
+  bool const isCapabilities = answer.size() >= 30 && answer[kAuthenticationTypeInHeader] == 0 && answer[kCommand] == 0x38;
+  if (!isCapabilities) return answer;
+  answer[kTypes] = static_cast<char>(answer[kTypes] & 0x7F);
+  answer[kExtended] = 0;
+  unsigned char sum = 0;
+  for (std::size_t place = kMessage; place + 1 < answer.size(); ++place)
+    sum = static_cast<unsigned char>(sum + static_cast<unsigned char>(answer[place]));
+  answer.back() = static_cast<char>(-sum);
+  return answer;
+}
+
+TEST_F(IpmiClientTest, AControllerThatSpeaksOnly15IsSpokenToLikeThat) {
+  Start({"127.0.0.1", 6240});
+  std::atomic<int> asked2{0};
+  TUdpPeer const relay(623, [&](std::string const& datagram) -> std::optional<std::string> {
+    constexpr char kAuthenticationTypeOfVersion2 = 6;
+    if (datagram.size() > 4 && datagram[4] == kAuthenticationTypeOfVersion2) ++asked2;
+    auto const answer = AskOf(6240, datagram);
+    return answer ? std::optional(WithoutVersion2(*answer)) : std::nullopt;
+  });
+  auto const start = TClock::now();
+  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  EXPECT_LT(SecondsSince(start), 4);
+  EXPECT_EQ(client_.open(kIpmiClientLan, "127.0.0.1", "623", "nobody", "zeppass1"), kIpmiClientUnknownUser);
+  EXPECT_EQ(client_.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "wrong"), kIpmiClientWrongPassword);
+  EXPECT_EQ(client_.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "seventeen letters"), kIpmiClientBadArgument)
+      << "version 1.5 has room for 16";
+  EXPECT_EQ(asked2, 0) << "nothing was sent in version 2.0";
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,193 @@
+// The identity of remote servers, from simulated controllers: by the library, and by zep.
+
+#include "TOSSpecific.h"
+#include "tests/system/ipmi/IpmiBed.h"
+#include "tests/tools/zep/Zep.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <chrono>
+#include <set>
+
+namespace NQRVZEP20 {
+namespace {
+
+using testing::HasSubstr;
+using TClock = std::chrono::steady_clock;
+
+double SecondsSince(TClock::time_point start) { return std::chrono::duration<double>(TClock::now() - start).count(); }
+
+class RemoteSystemTest : public testing::Test {
+protected:
+  void SetUp() override {
+    NEEDS(HasIpmiBed(), kIpmiBedNeeds);
+    EnterNetworkNamespace();
+  }
+
+  // A FRU image of that size with the type and model at its place.
+  std::string FruOf(std::size_t size) {
+    std::string image(size, ' ');
+    image.replace(0, 8, "\1\0\0\0\0\0\0\xFF"s);
+    image.replace(0x1AC, 8, "1234AB7\0"s);
+    WriteFile(dir_.Path("fru"), image);
+    return dir_.Path("fru");
+  }
+
+  TTempDir dir_;
+};
+
+// ---- The library ----
+
+class RemoteLibraryTest : public RemoteSystemTest {
+protected:
+  // The library's own search finds libipmiClient.so only beside libzepcore.so, which is where the build has it.
+  static std::vector<std::string> IdentityOf(std::string const& host, std::string const& password = "zeppass1") {
+    return {TOSSpecific::GetRemoteMT(host, "zepadmin", password), TOSSpecific::GetRemoteMachineModel(host, "zepadmin", password),
+            TOSSpecific::GetRemoteMSN(host, "zepadmin", password)};
+  }
+};
+
+TEST_F(RemoteLibraryTest, ReadsTheIdentityOfTheControllersServer) {
+  TSimulator one({"127.0.0.1", 623}), two({"127.0.0.2", 623, "5678XY1", "ZZ99"});
+  one.WaitUntilReady();
+  two.WaitUntilReady();
+  EXPECT_THAT(IdentityOf("127.0.0.1"), testing::ElementsAre("1234", "AB7", "KQ12345"));
+  EXPECT_THAT(IdentityOf("127.0.0.2"), testing::ElementsAre("5678", "XY1", "ZZ99\0  "s)) << "a zero byte ends the serial number";
+  EXPECT_THAT(IdentityOf("127.0.0.1", "wrong"), testing::ElementsAre("", "", ""));
+}
+
+TEST_F(RemoteLibraryTest, WhatTheControllerRefusesIsNotAvailable) {
+  TSimulator::TSettings settings;
+  settings.fru = FruOf(0x1C0);  // ends in front of the serial number
+  TSimulator simulator(settings);
+  simulator.WaitUntilReady();
+  EXPECT_THAT(IdentityOf("127.0.0.1"), testing::ElementsAre("1234", "AB7", "N/A"));
+}
+
+TEST_F(RemoteLibraryTest, AShortAnswerGivesWhatIsThere) {
+  TSimulator::TSettings settings;
+  settings.fru = FruOf(0x1CC + 3);
+  TSimulator simulator(settings);
+  simulator.WaitUntilReady();
+  EXPECT_EQ(TOSSpecific::GetRemoteMSN("127.0.0.1", "zepadmin", "zeppass1"), "   ");
+}
+
+// ---- zep remote ----
+
+class ZepRemoteTest : public RemoteSystemTest {
+protected:
+  ZepRemoteTest() { zep_.Add("libipmiClient.so", TEST_LIB_DIR "/libipmiClient.so"); }
+
+  zep::TRun Run(std::vector<std::string> arguments, std::string const& password = "zeppass1") {
+    arguments.insert(arguments.begin(), "remote");
+    arguments.insert(arguments.end(), {"--user", "zepadmin"});
+    zep::TCall call = {arguments};
+    call.environment = {{"ZEP_BMC_PASSWORD", password}};
+    call.hasNoTerminal = true;
+    return zep_.Run(call);
+  }
+
+  zep::TInstallation zep_;
+};
+
+TEST_F(ZepRemoteTest, TellsTypeModelAndSerialNumber) {
+  TSimulator simulator({});
+  simulator.WaitUntilReady();
+  zep::TRun const run = Run({"127.0.0.1"});
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.output, "Remote server    127.0.0.1\nMachine type     1234\nModel            AB7\nSerial number    KQ12345\n");
+  EXPECT_EQ(run.errors, "");
+
+  zep::TRun const json = Run({"127.0.0.1", "--json"});
+  EXPECT_EQ(json.status, 0);
+  EXPECT_EQ(zep::JsonOf(json)["type"], "1234");
+  EXPECT_EQ(zep::JsonOf(json)["model"], "AB7");
+  EXPECT_EQ(zep::JsonOf(json)["serialNumber"], "KQ12345");
+
+  WriteFile(dir_.Path("password"), "zeppass1\nnot this line");
+  EXPECT_EQ(Run({"127.0.0.1", "--password-file", dir_.Path("password")}, "wrong").status, 0) << "the file counts first";
+}
+
+TEST_F(ZepRemoteTest, ARefusedAccountTellsNothing) {
+  TSimulator simulator({});
+  simulator.WaitUntilReady();
+  zep::TRun const run = Run({"127.0.0.1"}, "secret7");
+  EXPECT_EQ(run.status, 1);
+  EXPECT_THAT(run.errors, HasSubstr("zep: 127.0.0.1: no session with its controller after 0.0 s"));
+  EXPECT_EQ((run.output + run.errors).find("secret7"), std::string::npos);
+}
+
+TEST_F(ZepRemoteTest, WhatIsMissingIsTold) {
+  TSimulator::TSettings settings;
+  settings.fru = FruOf(0x1C0);
+  TSimulator simulator(settings);
+  simulator.WaitUntilReady();
+  zep::TRun const run = Run({"127.0.0.1", "--json"});
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(zep::JsonOf(run)["type"], "1234");
+  EXPECT_TRUE(zep::JsonOf(run)["serialNumber"].is_null());
+  EXPECT_EQ(zep::JsonOf(run)["error"], "the controller did not tell everything");
+}
+
+TEST_F(ZepRemoteTest, ThePasswordReachesNeitherOutputNorLog) {
+  TSimulator simulator({});
+  simulator.WaitUntilReady();
+  std::string const log = dir_.Path("log");
+  zep::TRun const run = Run({"127.0.0.1", "--debug-log", log});
+  EXPECT_EQ(run.status, 0);
+  EXPECT_THAT(ReadFile(log), HasSubstr("rspBuffer for GetRemoteMSN:"));
+  EXPECT_EQ((run.output + run.errors + ReadFile(log)).find("zeppass1"), std::string::npos);
+}
+
+TEST_F(ZepRemoteTest, AHostHasItsTime) {
+  TUdpPeer silent(623, [](std::string const&) { return std::nullopt; });
+  auto const start = TClock::now();
+  zep::TRun const run = Run({"127.0.0.1", "--timeout", "1"});
+  EXPECT_LT(SecondsSince(start), 3);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors, "zep: 127.0.0.1: not done after 1 s\n");
+}
+
+// Controllers that answer, that are silent, and that cannot be reached.
+TEST_F(ZepRemoteTest, AListOfAThousandIsDoneWhateverBecomesOfSome) {
+  NEEDS(std::system("command -v ip >/dev/null") == 0, "ip (package iproute2)");
+  ASSERT_EQ(std::system(
+                "ip link add silent0 type veth peer name silent1 && ip link set silent0 arp off up && ip link set silent1 up && "
+                "ip addr add 192.0.2.1/24 dev silent0 && ip route add unreachable 198.51.100.0/24"),
+            0);
+  TSimulator::TSettings settings;
+  settings.address = "0.0.0.0";
+  TSimulator simulator(settings);  // answers at every address of loopback
+  simulator.WaitUntilReady();
+  std::string hosts;
+  for (int n = 0; n < 1000; ++n) {
+    std::string const last = std::to_string(n % 200 + 2);
+    if (n % 20 == 7)
+      hosts += "192.0.2." + last + "\n";  // silent
+    else if (n % 20 == 11)
+      hosts += "198.51.100." + last + "\n";  // unreachable
+    else
+      hosts += "127.1." + std::to_string(n / 200) + "." + last + "\n";
+  }
+  WriteFile(dir_.Path("hosts"), hosts);
+  auto const start = TClock::now();
+  zep::TRun const run = Run({"--hosts", dir_.Path("hosts"), "--parallel", "50"});
+  EXPECT_LT(SecondsSince(start), 60);
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(run.errors, "zep: 1000 of 1000 hosts done, 100 failed\n");
+  std::multiset<std::string> told, asked;
+  for (std::string const& line : zep::LinesOf(hosts)) asked.insert(line);
+  for (std::string const& line : zep::LinesOf(run.output)) {
+    auto const json = nlohmann::json::parse(line);
+    std::string const host = json["host"];
+    told.insert(host);
+    bool const isThere = host.rfind("127.1.", 0) == 0;
+    EXPECT_EQ(json["serialNumber"].is_null(), !isThere) << line;
+    EXPECT_EQ(json.contains("error"), !isThere) << line;
+  }
+  EXPECT_EQ(told, asked);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,109 @@
+// MountDevice and UnmountDevice with real images. Regular files serve as devices here: mount takes a loop device by itself.
+
+#include "tests/system/media/MediaSupport.h"
+
+namespace NQRVZEP20 {
+namespace {
+
+// What the function returns in a child that has mount points of its own.
+template <class TFunction>
+std::string WithMountPoints(TFunction function) {
+  return InChild([&] {
+    MakeMountPoints();
+    return function();
+  });
+}
+
+std::string StatusOf(std::function<void()> const& function) {
+  try {
+    function();
+    return "no exception";
+  } catch (TZEPException const& thrown) {
+    return thrown.what();
+  }
+}
+
+class MediaMountTest : public testing::Test {
+protected:
+  void SetUp() override {
+    NEEDS_IMAGES();
+    MakeImage(dir_.Path("key"), "whole");
+    MakeImage(dir_.Path("part1"), "partition");  // of the "device" part, which itself cannot be mounted
+    WriteFile(dir_.Path("part"), std::string(4096, '\0'));
+  }
+
+  TTempDir dir_;
+  std::string const key_ = dir_.Path("key"), part_ = dir_.Path("part");
+};
+
+TEST_F(MediaMountTest, AWholeDeviceIsMountedAndUnmounted) {
+  EXPECT_EQ(WithMountPoints([&] {
+              std::string text = TOSSpecific::MountDevice(key_);
+              text += " " + ReadFile("/mnt/key/label.txt");
+              TOSSpecific::UnmountDevice("whatever", "/mnt/key");
+              return text + (TOSSpecific::FileExists("/mnt/key/label.txt") ? " mounted" : " unmounted");
+            }),
+            "/mnt/key whole unmounted");
+}
+
+TEST_F(MediaMountTest, AFirstPartitionIsMountedWhenTheDeviceHasNoFileSystem) {
+  EXPECT_EQ(WithMountPoints([&] {
+              std::string const mountPoint = TOSSpecific::MountDevice(part_);
+              return mountPoint + " " + ReadFile("/mnt/key/label.txt");
+            }),
+            "/mnt/key partition");
+}
+
+TEST_F(MediaMountTest, AMountedKeyStaysEvenForAnotherDevice) {
+  EXPECT_EQ(WithMountPoints([&] {
+              TOSSpecific::MountDevice(key_);
+              std::string const mounts = ReadFile("/proc/self/mounts");
+              std::string const mountPoint = TOSSpecific::MountDevice(part_);
+              bool const isUnchanged = ReadFile("/proc/self/mounts") == mounts;
+              return mountPoint + " " + ReadFile("/mnt/key/label.txt") + (isUnchanged ? " unchanged" : " changed");
+            }),
+            "/mnt/key whole unchanged");
+}
+
+TEST_F(MediaMountTest, AKeyIsNoHindranceToAFloppy) {
+  EXPECT_EQ(WithMountPoints([&] {
+              TOSSpecific::MountDevice(key_);
+              return StatusOf([] { TOSSpecific::MountDevice("/dev/fd1"); });  // there is none, and so it was tried
+            }),
+            "kZEPStatusFileSystemError");
+}
+
+TEST_F(MediaMountTest, WhatCannotBeMountedThrows) {
+  struct TRow {
+    char const* what;
+    std::function<void()> prepare;
+    std::string device;
+  };
+  TRow const rows[] = {
+      {"no file system", [] {}, "/dev/null"},
+      {"a device that is not there", [] {}, dir_.Path("nothing")},
+      {"a device that goes away", [&] { std::filesystem::remove(key_); }, key_},
+      {"no mount point", [] { std::filesystem::remove("/mnt/key"); }, key_},
+  };
+  for (TRow const& row : rows)
+    EXPECT_EQ(WithMountPoints([&] {
+                row.prepare();
+                return StatusOf([&] { TOSSpecific::MountDevice(row.device); });
+              }),
+              "kZEPStatusFileSystemError")
+        << row.what;
+}
+
+TEST_F(MediaMountTest, ABusyMountPointAndOneWithoutMediumCannotBeUnmounted) {
+  EXPECT_EQ(WithMountPoints([&] {
+              std::string text = StatusOf([] { TOSSpecific::UnmountDevice("", "/mnt/key"); });
+              TOSSpecific::MountDevice(key_);
+              std::ifstream const user("/mnt/key/label.txt");
+              text += " " + StatusOf([] { TOSSpecific::UnmountDevice("", "/mnt/key"); });
+              return text + (TOSSpecific::FileExists("/mnt/key/label.txt") ? " mounted" : " unmounted");
+            }),
+            "kZEPStatusFileSystemError kZEPStatusFileSystemError mounted");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,61 @@
+#pragma once
+
+// Real media for tests: images on loop devices, mounted in a mount namespace of a child process.
+
+#include "tests/os/HostTools.h"
+#include "tests/os/Programs.h"
+
+#include <fcntl.h>
+
+#include <cstdlib>
+#include <stdexcept>
+
+namespace NQRVZEP20 {
+
+// Runs a command of the shell and throws, with what it printed, when it fails.
+inline std::string Do(std::string const& command) {
+  TProgramRun const run = RunProgram("(" + command + ") 2>&1");
+  if (run.exitCode != 0) throw std::runtime_error(command + ": " + run.output);
+  return run.output;
+}
+
+// For use in a child: /mnt is a file system of the child's own, with the two directories for media.
+inline void MakeMountPoints() {
+  if (!MountTmpfs("/mnt", "") || !MountTmpfs("/run", "")) throw std::runtime_error("cannot mount");
+  std::filesystem::create_directory("/mnt/key");
+  std::filesystem::create_directory("/mnt/floppy");
+}
+
+// An image with an ext4 file system that holds the file label.txt with this text.
+inline void MakeImage(std::string const& path, std::string const& label, std::string const& size = "4M") {
+  TTempDir const content;
+  WriteFile(content.Path("label.txt"), label);
+  Do("truncate -s " + size + " " + path);
+  Do("/usr/sbin/mke2fs -q -F -t ext4 -m 0 -d " + content.Path() + " " + path);
+}
+
+// A loop device with an image, as long as it lives.
+class TLoopDevice {
+public:
+  explicit TLoopDevice(std::string const& image, std::string const& options = "") {
+    fPath = Do("/usr/sbin/losetup --find --show " + options + " " + image);
+    fPath.erase(fPath.find_last_not_of('\n') + 1);
+  }
+  ~TLoopDevice() { RunProgram("/usr/sbin/losetup --detach " + fPath + " 2>/dev/null"); }
+  TLoopDevice(TLoopDevice const&) = delete;
+  TLoopDevice& operator=(TLoopDevice const&) = delete;
+
+  std::string const& Path() const { return fPath; }
+
+private:
+  std::string fPath;
+};
+
+// Whether images can be mounted here.
+inline bool MayMountImages() {
+  return MayMount() && RunProgram("/usr/sbin/losetup --find >/dev/null 2>&1 && test -x /usr/sbin/mke2fs").exitCode == 0;
+}
+
+#define NEEDS_IMAGES() NEEDS(MayMountImages(), "mounting images needs root, loop devices and e2fsprogs")
+
+}  // namespace NQRVZEP20

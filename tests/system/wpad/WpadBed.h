@@ -1,0 +1,72 @@
+#pragma once
+
+// Commands beside a real DHCP server, in namespaces of their own (run-in-netns.sh).
+
+#include "tests/Support.h"
+
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstdlib>
+
+namespace NQRVZEP20 {
+
+using TLines = std::vector<std::string>;
+
+inline TLines LinesOf(std::string const& text) {
+  TLines lines;
+  std::istringstream stream(text);
+  for (std::string line; std::getline(stream, line);) lines.push_back(line);
+  return lines;
+}
+
+inline bool IsThere(std::string const& program) {
+  return std::system(("PATH=$PATH:/usr/sbin:/sbin command -v " + program + " > /dev/null").c_str()) == 0;
+}
+
+class TWpadBed : public testing::Test {
+protected:
+  void SetUp() override {
+    NEEDS(::geteuid() == 0, "only root makes networks");
+    for (auto const& [program, package] : {std::pair{"dhcpd", "isc-dhcp-server"},
+                                           {"ip", "iproute2"},
+                                           {"python3", "python3"},
+                                           {"ps", "procps"},
+                                           {"ifconfig", "net-tools"},
+                                           {"busybox", "busybox"},
+                                           {"dnsmasq", "dnsmasq-base"}})
+      NEEDS(IsThere(program), std::string("no ") + program + " (package " + package + ")");
+  }
+
+  // What the shell command printed within the namespaces, and its exit status. `settings` are those of run-in-netns.sh, and
+  // whatever else is to be in the environment: "WPAD_SERVER=none ".
+  struct TRun {
+    int status;
+    std::string output, errors;
+  };
+  TRun RunInside(std::string const& settings, std::string const& command) {
+    WriteFile(dir_.Path("command"), command);
+    std::string const call = "PATH=$PATH:/usr/sbin:/sbin PROBE=" WPAD_PROBE " ZEP=" TEST_BIN_DIR "/zep HURRY=" WPAD_HURRY " " +
+                             settings + " timeout 60 " ZEP_SOURCE_DIR "/tests/system/wpad/run-in-netns.sh bash " +
+                             dir_.Path("command") + " < /dev/null > " + dir_.Path("out") + " 2> " + dir_.Path("err");
+    int const status = std::system(call.c_str());
+    return {WIFEXITED(status) ? WEXITSTATUS(status) : -1, ReadFile(dir_.Path("out")), ReadFile(dir_.Path("err"))};
+  }
+
+  // The same of a command that succeeds.
+  std::string Inside(std::string const& settings, std::string const& command) {
+    TRun const run = RunInside(settings, command);
+    EXPECT_EQ(run.status, 0) << run.errors;
+    return run.output;
+  }
+
+  // A file for the server "bytes".
+  std::string ReplyFile(std::string const& hexadecimal) {
+    WriteFile(dir_.Path("reply"), hexadecimal);
+    return "WPAD_SERVER=bytes WPAD_REPLY=" + dir_.Path("reply") + " ";
+  }
+
+  TTempDir dir_;
+};
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,308 @@
+// The discovery of the web proxy beside real DHCP servers, in namespaces of their own (run-in-netns.sh). Where it does not
+// matter how long a wait is, WpadProbe waits a twentieth of it and says so: "(up to 6 s)".
+
+#include "tests/system/wpad/WpadBed.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+
+namespace NQRVZEP20 {
+namespace {
+
+TLines operator+(TLines left, TLines const& right) {
+  left.insert(left.end(), right.begin(), right.end());
+  return left;
+}
+
+// What WpadProbe printed.
+struct TDiscovery {
+  std::string url;
+  long milliseconds = -1;
+  TLines log;
+};
+
+TLines const kStops = {"[Debug] SpawnProcess: process ps"};
+TLines const kUp = {"[Debug] the interface status is UP!"};
+TLines const kDown = {"[Debug] the interface status is DOWN!"};
+TLines const kAsks4 = {"[Debug] IP v4 Format!"};
+TLines const kAsks6 = {"[Debug] IP v6 Format!"};
+TLines const kWaits = {"[Debug] (up to 6 s)"};
+TLines const kUnheard = kWaits + TLines{"[Debug] receiving  DHCP message error!"};
+TLines const kUnsent = TLines{"[Debug] sending DHCP message error!"} + kUnheard;
+TLines const kShows = {"[Debug] SpawnProcess: process ifconfig"};
+TLines const kFound = {"[Debug] Get  DHCP wpadurl is =http://wpad.test/wpad.dat"};
+TLines const kFoundBy6 = {"[Debug] Get  DHCP wpadurl via IPV6 is =http://wpad.test/wpad.dat"};
+
+TLines Thrice(TLines const& lines) { return lines + lines + lines; }
+
+class WpadTest : public TWpadBed {
+protected:
+  static TDiscovery DiscoveryIn(std::string const& output) {
+    TLines const lines = LinesOf(output);
+    TDiscovery discovery;
+    if (lines.size() < 2) {
+      ADD_FAILURE() << output;
+      return discovery;
+    }
+    return {lines[0], std::stol(lines[1]), TLines(lines.begin() + 2, lines.end())};
+  }
+
+  TDiscovery Discover(std::string const& settings, std::string const& before = "") {
+    return DiscoveryIn(Inside(settings, before + "\n$PROBE start"));
+  }
+
+  // The same, with short waits.
+  TDiscovery DiscoverInHurry(std::string const& settings, std::string const& before = "") {
+    return Discover("ZEP_WPAD_HURRY=1 " + settings, before);
+  }
+};
+
+std::string const kRecorded = "WPAD_SERVER=bytes WPAD_REPLY=" ZEP_TEST_DATA_DIR "/wpad/reply-kea.hex ";
+
+// ---- Answers ----
+
+TEST_F(WpadTest, TheServersAnswerIsTheResult) {
+  TDiscovery const found = Discover("");
+  EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
+  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kFound);
+}
+
+// The least of some, as another test may run beside this one. The server itself answers within a millisecond or two.
+TEST_F(WpadTest, AnAnsweredDiscoveryEndsAsSoonAsTheAnswerIsIn) {
+  TLines const lines = LinesOf(Inside("", "for _ in 1 2 3 4 5; do $PROBE start | sed -n 2p; done"));
+  ASSERT_EQ(lines.size(), 5u);
+  long least = 1000000;
+  for (std::string const& line : lines) least = std::min(least, std::stol(line));
+  RecordProperty("milliseconds", static_cast<int>(least));
+  EXPECT_LE(least, kIsSanitized ? 1000 : 50);
+}
+
+TEST_F(WpadTest, ALongUrlIsTakenWhole) {
+  std::string const url = "http://wpad.test/" + std::string(190, 'x');
+  EXPECT_EQ(Discover("WPAD_URL=" + url).url, url);
+}
+
+TEST_F(WpadTest, AnAnswerWithoutTheOptionEndsTheAttemptsAndIsNone) {
+  TDiscovery const found = DiscoverInHurry("WPAD_URL=-");
+  EXPECT_EQ(found.url, "");
+  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kWaits + kShows);
+}
+
+TEST_F(WpadTest, EveryAttemptSendsTheWholeMessageAndTheThirdMayBeAnswered) {
+  TLines const lines = LinesOf(Inside("ZEP_WPAD_HURRY=1 WPAD_SKIP=2 " + kRecorded,
+                                      "tr -d : < /sys/class/net/eth0/address; $PROBE start; cat $ZEP_WPAD_LOG"));
+  TLines const log = kStops + kUp + kAsks4 + kUnheard + kUnheard + kWaits + kFound;
+  ASSERT_EQ(lines.size(), 3 + log.size() + 4);
+  EXPECT_EQ(lines[1], "http://wpad.test/wpad.dat");
+  EXPECT_EQ(TLines(lines.begin() + 3, lines.end() - 4), log);
+  std::string const message =
+      "01010600bf07000000000000"
+      "0a4d0002" +
+      std::string(2 * 12, '0') + lines[0] + std::string(2 * 202, '0') +
+      "63825363"
+      "350108"
+      "3701fc"
+      "ff" +
+      std::string(2 * 1225, '0');
+  EXPECT_EQ(TLines(lines.end() - 4, lines.end()), (TLines{"listening", message, message, message}));
+}
+
+TEST_F(WpadTest, WhateverComesIsAReply) {
+  struct {
+    char const* what;
+    std::string reply;
+    std::string url;
+  } const rows[] = {
+      {"nothing", "", ""},
+      {"one byte", "fc", ""},
+      {"no options", std::string(2 * 240, '0'), ""},
+      {"no reply at all, but with the option", std::string(2 * 240, 'f') + "fc0175", "u"},
+      {"a longer message than is taken", std::string(2 * 240, '0') + "fc03", std::string(3, '\0')},
+      {"all ones", [] { return std::string(2 * 1472, 'f'); }(), ""},
+      {"a length behind the end", std::string(2 * 240, '0') + "01ff" + std::string(2 * 255, '1') + "fcff61",
+       "a" + std::string(254, '\0')},
+  };
+  for (auto const& row : rows) {
+    SCOPED_TRACE(row.what);
+    std::string const output = Inside("ZEP_WPAD_HURRY=1 " + ReplyFile(row.reply), "$PROBE start");
+    EXPECT_EQ(output.substr(0, output.find('\n')), row.url);
+    std::size_t const end = output.find("[Debug] receiving  DHCP message error!");
+    EXPECT_EQ(end, std::string::npos) << output;
+  }
+}
+
+TEST_F(WpadTest, AServerThatAnswersToTheSendersPortIsNeverHeard) {
+  std::string const output = Inside("ZEP_WPAD_HURRY=1 WPAD_SERVER=dnsmasq", "$PROBE start; grep -c DHCPACK $ZEP_WPAD_LOG");
+  TLines lines = LinesOf(output);
+  EXPECT_EQ(lines.back(), "3");
+  EXPECT_EQ(lines.front(), "");
+  EXPECT_EQ(TLines(lines.begin() + 2, lines.end() - 1), kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows);
+}
+
+// ---- No answer ----
+
+TEST_F(WpadTest, NoAnswerTakesThreeTimesSixSeconds) {
+  TDiscovery const found = Discover("WPAD_SERVER=none");
+  EXPECT_EQ(found.url, "");
+  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice({"[Debug] receiving  DHCP message error!"}) + kShows);
+  EXPECT_GE(found.milliseconds, 18000);
+  EXPECT_LE(found.milliseconds, 20000);
+}
+
+TEST_F(WpadTest, WithoutARouteNothingIsSent) {
+  EXPECT_EQ(DiscoverInHurry("WPAD_ROUTE=none").log, kStops + kUp + kAsks4 + Thrice(kUnsent) + kShows);
+}
+
+TEST_F(WpadTest, ATakenPortIsWaitedForAndThenNothingIsHeard) {
+  TDiscovery const found = DiscoverInHurry("", R"sh(
+    python3 -c 'import socket, time; s = socket.socket(socket.AF_INET, socket.SOCK_DGRAM); s.bind(("", 68)); time.sleep(60)' &
+    for _ in $(seq 100); do [ -n "$(ss -Hlnu 'sport = :68')" ] && break; sleep 0.05; done)sh");
+  EXPECT_EQ(found.url, "");
+  TLines const refused = {"[Debug] bind to DHCP_CLIENT_PORT failed!"};
+  TLines retries;
+  for (int retry = 1; retry <= 10; ++retry) retries = retries + refused + TLines{"[Debug] (up to 3 s)"};
+  EXPECT_EQ(found.log, kStops + kUp + retries + refused + kAsks4 + Thrice(kUnheard) + kShows);
+}
+
+// ---- Interfaces ----
+
+TEST_F(WpadTest, TheSecondInterfaceIsAskedForWhenTheFirstIsNotAnswered) {
+  TDiscovery const found = DiscoverInHurry("WPAD_FIRST=up WPAD_NAME=eth1");
+  EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
+  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice(kUnheard) + kUp + kAsks4 + kWaits + kFound);
+}
+
+TEST_F(WpadTest, AnInterfaceThatIsDownIsAskedForAllTheSame) {
+  TDiscovery const found = DiscoverInHurry("WPAD_FIRST=down WPAD_NAME=eth1");
+  EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
+  EXPECT_EQ(found.log, kStops + kDown + kAsks4 + Thrice(kUnheard) + kUp + kAsks4 + kWaits + kFound);
+}
+
+TEST_F(WpadTest, APromiscuousInterfaceIsSaidToBe) {
+  EXPECT_EQ(Discover("", "ip link set eth0 promisc on").log,
+            kStops + TLines{"[Debug] the interface is PROMISC!"} + kUp + kAsks4 + kFound);
+}
+
+TEST_F(WpadTest, AnInterfaceOfSeveralAddressesIsAskedForOnce) {
+  EXPECT_EQ(DiscoverInHurry("WPAD_SERVER=none", "ip addr add 10.88.0.2/24 dev eth0").log,
+            kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows);
+}
+
+TEST_F(WpadTest, AnInterfaceOfAnotherNameIsNotAskedFor) {
+  TDiscovery const found = Discover("WPAD_NAME=net0");
+  EXPECT_EQ(found.url, "");
+  EXPECT_EQ(found.log, kStops + kShows);
+}
+
+TEST_F(WpadTest, WhatTheSystemDoesNotTellEndsTheInterface) {
+  struct {
+    char const* settings;
+    TLines log;
+  } const rows[] = {
+      {"ZEP_WPAD_FAIL=0x8912", kStops + TLines{"[Debug] cpm: send ioctl error !"} + kShows},
+      {"ZEP_WPAD_FAIL=0x8913", kStops + TLines{"[Debug] cpm: ioctl device eth0"} + kShows},
+      {"ZEP_WPAD_FAIL=0x8915", kStops + kUp + TLines{"[Debug] cpm: ioctl device eth0"} + kShows},
+      {"ZEP_WPAD_FAIL=0x8927", kStops + kUp + TLines{"[Debug] cpm: ioctl device eth0"} + kShows},
+      {"ZEP_WPAD_FAIL=0x8915 WPAD_FIRST=up WPAD_NAME=eth1",
+       kStops + kUp + TLines{"[Debug] cpm: ioctl device eth0"} + kUp + kAsks4 + kFound},
+  };
+  for (auto const& row : rows) {
+    SCOPED_TRACE(row.settings);
+    EXPECT_EQ(Discover(row.settings).log, row.log);
+  }
+}
+
+TEST_F(WpadTest, NothingIsThrownWhereNothingCanBeOpened) {
+  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs descriptors of its own";
+  TLines const noPipe = {"[Debug] ERROR: SpawnProcess - pipe call failed!"};
+  TDiscovery const found = Discover("ZEP_WPAD_NO_DESCRIPTORS=1");
+  EXPECT_EQ(found.url, "");
+  EXPECT_EQ(found.log, kStops + noPipe + TLines{"[Debug] cpm: send socket error!"} + kShows + noPipe);
+}
+
+// ---- The second round ----
+
+TEST_F(WpadTest, AnIPV6AddressIsFoundInWhatBusyboxPrints) {
+  TDiscovery const found = DiscoverInHurry("WPAD_SERVER=none WPAD_IFCONFIG=busybox");
+  EXPECT_EQ(found.url, "");
+  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows + kAsks6 + Thrice(kUnheard));
+}
+
+TEST_F(WpadTest, TheIPV6RoundTellsNoAddressAndTheHardwareAddressReadLast) {
+  TLines const lines = LinesOf(Inside("ZEP_WPAD_HURRY=1 WPAD_IFCONFIG=busybox WPAD_SKIP=3 " + kRecorded,
+                                      "tr -d : < /sys/class/net/eth0/address; $PROBE start; cat $ZEP_WPAD_LOG"));
+  TLines const log = kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows + kAsks6 + kWaits + kFoundBy6;
+  ASSERT_EQ(lines.size(), 3 + log.size() + 5);
+  EXPECT_EQ(lines[1], "http://wpad.test/wpad.dat");
+  EXPECT_EQ(TLines(lines.begin() + 3, lines.end() - 5), log);
+  EXPECT_EQ(lines.back().substr(0, 68), "01010600bf07000000000000" + std::string(2 * 16, '0') + lines[0]);
+  EXPECT_EQ(lines.back().size(), 2 * 1472u);
+}
+
+// The interface that the server knows is none of those asked for; without an address in the message it answers to the sender.
+TEST_F(WpadTest, TheIPV6RoundMayBeAnsweredByARealServer) {
+  TDiscovery const found = DiscoverInHurry("WPAD_IFCONFIG=busybox WPAD_FIRST=up WPAD_NAME=net1");
+  EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
+  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows + kAsks6 + kWaits + kFoundBy6);
+}
+
+TEST_F(WpadTest, TheIPV6RoundNeedsNoInterface) {
+  TDiscovery const found = DiscoverInHurry("WPAD_IFCONFIG=busybox WPAD_NAME=net0 WPAD_ROUTE=none");
+  EXPECT_EQ(found.log, kStops + kShows + kAsks6 + TLines{"[Debug] invalid MAC Format!"} + Thrice(kUnsent));
+}
+
+TEST_F(WpadTest, TheAddressEndsAtItsPrefixLengthOrABlank) {
+  for (std::string const shown : {"x inet6 addr: fd77::2/64 Scope:Link", "inet6 addr: fd77::2", "inet6 addr: fd77::2 /64",
+                                  "inet6 addr: fd77::2/64\ninet6 addr: rubbish", "inet6 fe80::9\ninet6 addr: fd77::2\n"}) {
+    SCOPED_TRACE(shown);
+    WriteFile(dir_.Path("shown"), shown);
+    TDiscovery const found = DiscoverInHurry("WPAD_URL=-", "mkdir /dev/shm/bin; printf '#!/bin/sh\\ncat " + dir_.Path("shown") +
+                                                               "' > /dev/shm/bin/ifconfig; chmod +x /dev/shm/bin/ifconfig\n"
+                                                               "PATH=/dev/shm/bin:$PATH");
+    EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kWaits + kShows + kAsks6 + kWaits);
+  }
+}
+
+// ---- DHCP clients ----
+
+TEST_F(WpadTest, DhcpClientsAreEnded) {
+  TLines const lines = LinesOf(Inside("WPAD_DHCLIENT=1", R"sh(
+    mkdir /dev/shm/bin; for name in xdhclient6 dhclien; do cp "$(command -v sleep)" /dev/shm/bin/$name; /dev/shm/bin/$name 99 & done
+    names() { ps -e -o comm= | grep -E 'dhclien' | sort | xargs; }
+    until [ "$(names | wc -w)" = 3 ]; do sleep 0.02; done
+    names; $PROBE stop; sleep 0.3; names; ls /dev/nul)sh"));
+  EXPECT_EQ(lines.size(), 6u);
+  EXPECT_EQ(lines[0], "dhclien dhclient xdhclient6");
+  EXPECT_EQ(TLines(lines.begin() + 3, lines.end()), (kStops + TLines{"dhclien", "/dev/nul"}));
+}
+
+TEST_F(WpadTest, WhatTheKillSaysLandsInAFile) {
+  EXPECT_NE(Inside("", R"sh(
+    mkdir /dev/shm/bin; printf '#!/bin/sh\necho "   99999 ? 00:00:00 dhclient"' > /dev/shm/bin/ps; chmod +x /dev/shm/bin/ps
+    PATH=/dev/shm/bin:$PATH $PROBE stop; cat /dev/nul)sh")
+                .find("No such process"),
+            std::string::npos);
+}
+
+TEST_F(WpadTest, WhereThatFileCannotBeMadeNothingIsEnded) {
+  TLines const lines = LinesOf(
+      Inside("WPAD_DHCLIENT=1",
+             "mkdir /dev/nul; until ps -e | grep -q dhclient; do sleep 0.02; done; $PROBE stop; ps -e -o comm= | grep dhclient"));
+  EXPECT_EQ(lines.back(), "dhclient");
+}
+
+TEST_F(WpadTest, ALineWithoutANumberEndsNothing) {
+  TLines const lines = LinesOf(Inside("", R"sh(
+    mkdir /dev/shm/bin; printf '#!/bin/sh\necho "dhclient; touch /dev/shm/run"; echo; echo "  ? dhclient"' > /dev/shm/bin/ps
+    chmod +x /dev/shm/bin/ps; PATH=/dev/shm/bin:$PATH $PROBE stop; ls /dev/shm; ls /dev/nul 2>&1 | grep -c 'No such file')sh"));
+  EXPECT_EQ(TLines(lines.end() - 2, lines.end()), (TLines{"bin", "1"}));
+}
+
+TEST_F(WpadTest, WithoutThePrograms) {
+  TDiscovery const found = Discover("WPAD_DHCLIENT=1 WPAD_URL=-", "PATH=/nowhere");
+  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kShows);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,273 @@
+// zep wpad, as users run it, beside real DHCP servers.
+
+#include "tests/system/wpad/WpadBed.h"
+
+#include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
+
+#include <regex>
+
+namespace NQRVZEP20 {
+namespace {
+
+std::string const kTable = "Interface         Address           Sent            Came back\n";
+std::string const kWillEnd =
+    "This ends the DHCP clients of this machine: every process with \"dhclient\" in its line of \"ps -e\".\n";
+
+class ZepWpadTest : public TWpadBed {
+protected:
+  // The times that are measured become "N ms".
+  TRun Zep(std::string const& settings, std::string const& command) {
+    TRun run = RunInside(settings, command);
+    run.output = std::regex_replace(run.output, std::regex("[0-9]+ ms"), "N ms");
+    return run;
+  }
+
+  nlohmann::json Json(std::string const& settings, std::string const& command) {
+    return nlohmann::json::parse(RunInside(settings, command).output);
+  }
+};
+
+// zep waits a twentieth of the time.
+std::string const kInHurry = "LD_PRELOAD=$HURRY ";
+
+TEST_F(ZepWpadTest, PrintsTheUrlAndWhatWasSentAndCameBack) {
+  TRun const run = Zep("", "$ZEP wpad --yes");
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.output, "http://wpad.test/wpad.dat\n\n" + kTable +
+                            "eth0              10.77.0.2         1 x 1472 bytes  300 bytes from 10.77.0.1\n"
+                            "                                                    after N ms, with the URL\n");
+  EXPECT_EQ(run.errors, kWillEnd + "  (none runs now)\n");
+}
+
+TEST_F(ZepWpadTest, PrintsJson) {
+  nlohmann::json const document = Json("", "$ZEP wpad --yes --json");
+  EXPECT_EQ(document["document"], "zep wpad");
+  EXPECT_EQ(document["version"], 1);
+  EXPECT_EQ(document["status"], "complete");
+  EXPECT_EQ(document["exitStatus"], 0);
+  EXPECT_EQ(document["url"], "http://wpad.test/wpad.dat");
+  EXPECT_EQ(document["stoppedClients"], true);
+  EXPECT_EQ(document["messageBytes"], 1472);
+  EXPECT_EQ(document["failure"], nullptr);
+  EXPECT_FALSE(document.contains("file"));
+  ASSERT_EQ(document["interfaces"].size(), 1u);
+  nlohmann::json const& asking = document["interfaces"][0];
+  EXPECT_EQ(asking["interface"], "eth0");
+  EXPECT_EQ(asking["up"], true);
+  EXPECT_EQ(asking["promiscuous"], false);
+  EXPECT_EQ(asking["address"], "10.77.0.2");
+  EXPECT_EQ(asking["hardwareAddress"].get<std::string>().size(), 17u);
+  EXPECT_EQ(asking["sent"], 1);
+  EXPECT_EQ(asking["reply"]["bytes"], 300);
+  EXPECT_EQ(asking["reply"]["from"], "10.77.0.1");
+  EXPECT_LT(asking["reply"]["milliseconds"], 1000);
+  EXPECT_EQ(asking["reply"]["url"], "http://wpad.test/wpad.dat");
+  EXPECT_EQ(asking["failure"], nullptr);
+}
+
+// ---- DHCP clients ----
+
+std::string const kOnceItRuns = "until ps -e | grep -q dhclient; do sleep 0.02; done; ";
+std::string const kIsItThere = "; sleep 0.3; ps -e -o comm= | grep -c dhclient; true";
+
+TEST_F(ZepWpadTest, SaysThatDhcpClientsWillBeEndedAndAsks) {
+  struct {
+    char const* what;
+    std::string command;
+    bool isEnded;
+  } const rows[] = {
+      {"yes", "echo y | $ZEP wpad", true}, {"yes in full", "echo yes | $ZEP wpad", true},
+      {"no", "echo n | $ZEP wpad", false}, {"something else", "echo yonder | $ZEP wpad", false},
+      {"no answer", "$ZEP wpad", false},
+  };
+  for (auto const& row : rows) {
+    SCOPED_TRACE(row.what);
+    TRun const run = Zep("WPAD_DHCLIENT=1", kOnceItRuns + row.command + kIsItThere);
+    EXPECT_EQ(LinesOf(run.output).back(), row.isEnded ? "0" : "1");
+    TLines const errors = LinesOf(run.errors);
+    ASSERT_GE(errors.size(), 3u);
+    EXPECT_EQ(errors[0] + "\n", kWillEnd);
+    EXPECT_NE(errors[1].find(" dhclient"), std::string::npos) << errors[1];
+    std::string const asked = "Go on? [y/N] ";
+    EXPECT_EQ(errors[2].substr(0, asked.size()), asked);
+    std::string const refused = "zep: nothing was done; --yes confirms, and --no-stop leaves the DHCP clients alone";
+    EXPECT_EQ(errors[2].substr(asked.size()) == refused, !row.isEnded) << errors[2];
+  }
+}
+
+TEST_F(ZepWpadTest, UnconfirmedIsNothing) { EXPECT_EQ(Zep("", "echo n | $ZEP wpad").status, 1); }
+
+TEST_F(ZepWpadTest, YesIsSaidOnTheCommandLine) {
+  TRun const run = Zep("WPAD_DHCLIENT=1", kOnceItRuns + "$ZEP wpad --yes" + kIsItThere);
+  EXPECT_EQ(LinesOf(run.output).back(), "0");
+  EXPECT_EQ(run.errors.find("Go on?"), std::string::npos) << run.errors;
+}
+
+TEST_F(ZepWpadTest, DhcpClientsAreLeftAloneWhenAsked) {
+  TRun const run = Zep("WPAD_DHCLIENT=1", kOnceItRuns + "$ZEP wpad --no-stop" + kIsItThere);
+  EXPECT_EQ(LinesOf(run.output).front(), "http://wpad.test/wpad.dat");
+  EXPECT_EQ(LinesOf(run.output).back(), "1");
+  EXPECT_EQ(run.errors, "");
+  EXPECT_EQ(Json("", "$ZEP wpad --no-stop --json")["stoppedClients"], false);
+}
+
+// ---- Nothing found ----
+
+TEST_F(ZepWpadTest, NoAnswer) {
+  TRun const run = Zep("WPAD_SERVER=none", kInHurry + "$ZEP wpad --no-stop");
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, kTable + "eth0              10.77.0.2         3 x 1472 bytes  nothing within 18 s\n");
+  EXPECT_EQ(run.errors, "zep: nobody named a proxy configuration file\n");
+}
+
+TEST_F(ZepWpadTest, AnAnswerWithoutAUrl) {
+  TRun const run = Zep("WPAD_URL=-", "$ZEP wpad --no-stop --fetch");
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, kTable +
+                            "eth0              10.77.0.2         1 x 1472 bytes  300 bytes from 10.77.0.1\n"
+                            "                                                    after N ms, without a URL\n");
+  nlohmann::json const document = Json("WPAD_URL=-", "$ZEP wpad --no-stop --fetch --json");
+  EXPECT_EQ(document["status"], "nothing");
+  EXPECT_EQ(document["url"], nullptr);
+  EXPECT_EQ(document["interfaces"][0]["reply"]["url"], nullptr);
+  EXPECT_FALSE(document.contains("file"));
+}
+
+TEST_F(ZepWpadTest, SaysOfEachInterfaceWhatBecameOfIt) {
+  struct {
+    char const* settings;
+    char const* before;
+    std::string rows;
+    char const* errors;
+  } const rows[] = {
+      {"WPAD_FIRST=up WPAD_NAME=eth1", "",
+       "eth0              10.99.0.2         3 x 1472 bytes  nothing within 18 s\n"
+       "eth1              10.77.0.2         1 x 1472 bytes  300 bytes from 10.77.0.1\n"
+       "                                                    after N ms, with the URL\n",
+       ""},
+      {"WPAD_FIRST=down WPAD_NAME=eth1", "ip addr flush dev eth0; ip link set eth1 promisc on; ",
+       "eth0, down                          nothing         it has no IPv4 address\n"
+       "eth1,             10.77.0.2         1 x 1472 bytes  300 bytes from 10.77.0.1\n"
+       "promiscuous                                         after N ms, with the URL\n",
+       ""},
+      {"WPAD_ROUTE=none", "",
+       "eth0              10.77.0.2         nothing         sending failed: Network is\n"
+       "                                                    unreachable\n",
+       "zep: nobody named a proxy configuration file\n"},
+      {"WPAD_FIRST=up WPAD_NAME=net1",
+       "mkdir /dev/shm/bin; printf '#!/bin/sh\\necho inet6 addr: fd77::2/64' > /dev/shm/bin/ifconfig; "
+       "chmod +x /dev/shm/bin/ifconfig; export PATH=/dev/shm/bin:$PATH; ",
+       "eth0              10.99.0.2         3 x 1472 bytes  nothing within 18 s\n"
+       "IPv6              fd77::2           1 x 1472 bytes  300 bytes from 10.77.0.1\n"
+       "                                                    after N ms, with the URL\n",
+       ""},
+      {"WPAD_NAME=net0", "", "", "zep: no interface has a name that begins with \"eth\"\n"},
+  };
+  for (auto const& row : rows) {
+    SCOPED_TRACE(row.settings);
+    TRun const run = Zep(row.settings, row.before + kInHurry + "$ZEP wpad --no-stop");
+    bool const isFound = *row.errors == '\0';
+    EXPECT_EQ(run.status, isFound ? 0 : 1);
+    EXPECT_EQ(run.output, (isFound ? "http://wpad.test/wpad.dat\n\n" : "") + (row.rows.empty() ? "" : kTable + row.rows));
+    EXPECT_EQ(run.errors, row.errors);
+  }
+}
+
+TEST_F(ZepWpadTest, APortThatStaysTakenEndsTheSearch) {
+  TRun const run = Zep("WPAD_FIRST=up WPAD_NAME=eth1", R"sh(
+    python3 -c 'import socket, time; s = socket.socket(socket.AF_INET, socket.SOCK_DGRAM); s.bind(("", 68)); time.sleep(60)' &
+    for _ in $(seq 100); do [ -n "$(ss -Hlnu 'sport = :68')" ] && break; sleep 0.05; done
+    LD_PRELOAD=$HURRY $ZEP wpad --no-stop)sh");
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, kTable +
+                            "eth0              10.99.0.2         nothing         another program holds port\n"
+                            "                                                    68\n");
+  EXPECT_EQ(run.errors, "zep: another program holds port 68; trying again for up to 30 s\nzep: another program holds port 68\n");
+}
+
+TEST_F(ZepWpadTest, OnlyRootMayListen) {
+  TRun const run = Zep("WPAD_DHCLIENT=1", R"sh(
+    mkdir -p /dev/shm/zep/bin /dev/shm/zep/lib; cp $ZEP /dev/shm/zep/bin; cp $(dirname $ZEP)/../lib/libzepcore.so /dev/shm/zep/lib
+    setpriv --reuid=65534 --regid=65534 --clear-groups /dev/shm/zep/bin/zep wpad --yes)sh");
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, "");
+  EXPECT_EQ(run.errors, "zep: port 68 cannot be listened on: Permission denied\n");
+}
+
+TEST_F(ZepWpadTest, ATerminalShowsACountdown) {
+  TRun const run = Zep("WPAD_SERVER=none", kInHurry + "script -qec '$ZEP wpad --no-stop' /dev/null < /dev/null");
+  for (int left = 18; left > 0; --left)
+    EXPECT_NE(run.output.find("\rWaiting for an answer to 10.77.0.2: " + std::to_string(left) + " s left"), std::string::npos)
+        << left << " in " << run.output;
+  std::string const wiped = '\r' + std::string(std::string("Waiting for an answer to 10.77.0.2: 18 s left").size(), ' ') + '\r';
+  EXPECT_NE(run.output.find(wiped + "Interface"), std::string::npos) << run.output;
+}
+
+// ---- The file ----
+
+std::string const kFile = "function FindProxyForURL(url, host) { return \"PROXY 10.77.0.1:3128\"; }\n";
+
+bool IsCurlThere() { return std::system("PATH=$PATH:/usr/sbin:/sbin ldconfig -p | grep -q 'libcurl\\.so\\.4 '") == 0; }
+
+TEST_F(ZepWpadTest, FetchesTheFile) {
+  NEEDS(IsCurlThere(), "no libcurl (package libcurl4)");
+  TRun const run = Zep("", "http_proxy=http://127.0.0.1:1 $ZEP wpad --no-stop --fetch");
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.output.substr(run.output.size() - kFile.size() - 1), "\n" + kFile);
+  EXPECT_EQ(run.errors, "");
+  nlohmann::json const document = Json("", "$ZEP wpad --no-stop --fetch --json");
+  EXPECT_EQ(document["status"], "complete");
+  EXPECT_EQ(document["file"], (nlohmann::json{{"text", kFile}, {"failure", nullptr}}));
+}
+
+TEST_F(ZepWpadTest, SaysWhyThereIsNoFile) {
+  NEEDS(IsCurlThere(), "no libcurl (package libcurl4)");
+  struct {
+    char const* settings;
+    char const* before;
+    char const* failure;
+  } const rows[] = {
+      {"WPAD_URL=http://wpad.test/missing", "", "The requested URL returned error: 404"},
+      {"WPAD_URL=http://nowhere.test/wpad.dat", "", "Could not resolve host: nowhere.test"},
+      {"WPAD_URL=file:///etc/hostname", "", "only files of plain HTTP are fetched"},
+      {"WPAD_URL=https://wpad.test/wpad.dat", "", "only files of plain HTTP are fetched"},
+      {"", "mount --bind /dev/null \"$(readlink -f \"$(ldconfig -p | awk '/libcurl\\.so\\.4 /{print $NF; exit}')\")\"; ",
+       "libcurl cannot be loaded: libcurl.so.2: cannot open shared object file: No such file or directory"},
+  };
+  for (auto const& row : rows) {
+    SCOPED_TRACE(row.failure);
+    TRun const run = RunInside(row.settings, std::string(row.before) + "$ZEP wpad --no-stop --fetch --json");
+    EXPECT_EQ(run.status, 2);
+    EXPECT_EQ(run.errors, std::string("zep: the file was not fetched: ") + row.failure + "\n");
+    auto const document = nlohmann::json::parse(run.output);
+    EXPECT_EQ(document["status"], "partial");
+    EXPECT_EQ(document["file"], (nlohmann::json{{"text", nullptr}, {"failure", row.failure}}));
+  }
+}
+
+TEST_F(ZepWpadTest, AUrlIsPrintedAsTextAndLosesItsEnd) {
+  // "http://a<escape>[2J", a newline and a zero byte
+  std::string const reply = ReplyFile(std::string(2 * 240, '0') + "fc0e" + "687474703a2f2f611b5b324a0a00");
+  EXPECT_EQ(LinesOf(Zep(reply, "$ZEP wpad --no-stop").output).front(), "http://a\\x1b[2J");
+  EXPECT_EQ(Json(reply, "$ZEP wpad --no-stop --json")["url"], "http://a\x1b[2J");
+}
+
+// ---- Usage ----
+
+TEST_F(ZepWpadTest, WrongUsage) {
+  for (char const* arguments : {"--yes --no-stop", "--unknown", "eth0"}) {
+    SCOPED_TRACE(arguments);
+    EXPECT_EQ(Zep("", std::string("$ZEP wpad ") + arguments).status, 64);
+  }
+}
+
+TEST_F(ZepWpadTest, HelpTellsOfTheDhcpClientsAndTheExitStatus) {
+  TRun const run = Zep("", "$ZEP wpad --help");
+  EXPECT_EQ(run.status, 0);
+  EXPECT_NE(run.output.find("the running DHCP clients are ended first"), std::string::npos);
+  EXPECT_NE(run.output.find("Exit status: 0 when there is an address"), std::string::npos);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,19 @@
+// To be preloaded: whoever waits by sleep or poll waits a twentieth of the time.
+
+#include <dlfcn.h>
+#include <poll.h>
+#include <unistd.h>
+
+#define EXPORT extern "C" __attribute__((visibility("default")))
+
+constexpr int kHurry = 20;
+
+EXPORT unsigned sleep(unsigned seconds) {
+  ::usleep(seconds * 1000000 / kHurry);
+  return 0;
+}
+
+EXPORT int poll(pollfd* watched, nfds_t count, int milliseconds) {
+  static auto* const next = reinterpret_cast<int (*)(pollfd*, nfds_t, int)>(::dlsym(RTLD_NEXT, "poll"));
+  return next(watched, count, milliseconds > 0 ? milliseconds / kHurry : milliseconds);
+}

@@ -1,0 +1,194 @@
+// zep remote without a controller: how it is called, where the password comes from, what it prints.
+
+#include "tests/tools/zep/Zep.h"
+#include "tools/zep/Controller.h"
+
+#include <gmock/gmock.h>
+#include <poll.h>
+#include <pty.h>
+
+#include <string>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+using testing::HasSubstr;
+
+std::string const kSaid = "1234\0AB7\0KQ12345\0\0"s;
+
+TEST(RemoteIdentityTextTest, PutsTogetherWhatTheProcessSaid) {
+  TRemoteIdentity const whole = IdentityFrom("h", kSaid, true);
+  EXPECT_TRUE(IsComplete(whole));
+  EXPECT_FALSE(IsNothing(whole));
+  EXPECT_EQ(AsJson(whole).dump(), R"({"host":"h","type":"1234","model":"AB7","serialNumber":"KQ12345"})");
+  EXPECT_EQ(AsText(whole), "Remote server    h\nMachine type     1234\nModel            AB7\nSerial number    KQ12345\n");
+
+  TRemoteIdentity const part = IdentityFrom("h", "1234\0\0\0why\0"s, true);
+  EXPECT_FALSE(IsComplete(part));
+  EXPECT_FALSE(IsNothing(part));
+  EXPECT_EQ(AsJson(part).dump(), R"({"host":"h","type":"1234","model":null,"serialNumber":null,"error":"why"})");
+  EXPECT_EQ(AsText(part), "Remote server    h\nMachine type     1234\nModel            unknown\nSerial number    unknown\n");
+}
+
+TEST(RemoteIdentityTextTest, AProcessThatDidNotEndToldNothing) {
+  for (std::string const& said : {""s, "12"s, kSaid}) {
+    TRemoteIdentity const identity = IdentityFrom("h", said, false);
+    EXPECT_TRUE(IsNothing(identity));
+    EXPECT_EQ(identity.fError, "the process that asked its controller did not come to its end");
+  }
+}
+
+TEST(RemoteIdentityTextTest, WhatAControllerSaysIsMadePrintable) {
+  TRemoteIdentity const identity = IdentityFrom("h", "12\x1B[2J\0A\xFF\0K\0\0"s, true);
+  EXPECT_THAT(AsText(identity), HasSubstr("12\\x1b[2J"));
+  EXPECT_THAT(AsText(identity), HasSubstr("A\\xff"));
+}
+
+class ZepRemoteTest : public testing::Test {
+protected:
+  TRun Run(std::vector<std::string> arguments, std::map<std::string, std::string> const& environment = {}) {
+    arguments.insert(arguments.begin(), "remote");
+    TCall call = {arguments};
+    call.environment = environment;
+    call.hasNoTerminal = true;
+    return zep_.Run(call);
+  }
+
+  std::string File(std::string const& name, std::string const& text) {
+    WriteFile(zep_.Path(name), text);
+    return zep_.Path(name);
+  }
+
+  TInstallation zep_;
+  std::map<std::string, std::string> const password_ = {{"ZEP_BMC_PASSWORD", "zeppass1"}};
+};
+
+std::string const kNothing =
+    "no session with its controller after 0.0 s: it gave no answer or refused the account, or libipmiClient.so is missing";
+
+TEST_F(ZepRemoteTest, WithoutTheClientLibraryNothingIsTold) {
+  TRun const run = Run({"192.0.2.1", "--user", "zepadmin"}, password_);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output,
+            "Remote server    192.0.2.1\nMachine type     unknown\nModel            unknown\nSerial number    unknown\n");
+  EXPECT_EQ(run.errors, "zep: 192.0.2.1: " + kNothing + "\n");
+
+  TRun const json = Run({"192.0.2.1", "--user", "zepadmin", "--json"}, password_);
+  EXPECT_EQ(json.status, 1);
+  EXPECT_EQ(JsonOf(json)["document"], "zep remote");
+  EXPECT_EQ(JsonOf(json)["host"], "192.0.2.1");
+  EXPECT_TRUE(JsonOf(json)["type"].is_null());
+  EXPECT_EQ(JsonOf(json)["error"], kNothing);
+}
+
+TEST_F(ZepRemoteTest, AListPrintsOneLineForEachHost) {
+  std::string const hosts = File("hosts", "# the machine room\n\none\n  two \t\r\nthree four\n#\none");
+  TRun const run = Run({"--hosts", hosts, "--user", "zepadmin", "--parallel", "1"}, password_);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors, "zep: 4 of 4 hosts done, 4 failed\n");
+  std::vector<std::string> names;
+  for (std::string const& line : LinesOf(run.output)) names.push_back(nlohmann::json::parse(line)["host"]);
+  EXPECT_THAT(names, testing::ElementsAre("one", "two", "three four", "one"));
+}
+
+TEST_F(ZepRemoteTest, WrongUsageIsToldApart) {
+  std::string const hosts = File("hosts", "one\n");
+  std::vector<std::vector<std::string>> const calls = {
+      {"--user", "u"},  // no host
+      {"host", "--hosts", hosts, "--user", "u"},
+      {"host"},  // no user
+      {"host", "--user", "u", "--password", "p"},
+      {"--hosts", hosts, "--user", "u", "--parallel", "0"},
+      {"--hosts", hosts, "--user", "u", "--parallel", "1001"},
+      {"--hosts", hosts, "--user", "u", "--timeout", "0"},
+      {"host", "--user", "u", "--timeout", "x"},
+      {"one", "two", "--user", "u"},
+  };
+  for (auto const& call : calls) {
+    SCOPED_TRACE(testing::PrintToString(call));
+    TRun const run = Run(call, password_);
+    EXPECT_EQ(run.status, 64);
+    EXPECT_EQ(run.output, "");
+    EXPECT_NE(run.errors, "");
+  }
+}
+
+TEST_F(ZepRemoteTest, AFileOfHostsThatCannotServeIsTold) {
+  std::string const absent = zep_.Path("absent"), empty = File("empty", "\n# nothing\n \n");
+  TRun const without = Run({"--hosts", absent, "--user", "u"}, password_);
+  EXPECT_EQ(without.status, 1);
+  EXPECT_EQ(without.errors, "zep: " + absent + " cannot be read\n");
+  EXPECT_EQ(Run({"--hosts", empty, "--user", "u"}, password_).errors, "zep: " + empty + " names no host\n");
+}
+
+TEST_F(ZepRemoteTest, WithoutATerminalThePasswordMustComeFromElsewhere) {
+  TRun const run = Run({"host", "--user", "u"});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors, "zep: there is no terminal to ask for the password: set ZEP_BMC_PASSWORD or use --password-file\n");
+  std::string const absent = zep_.Path("absent");
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", absent}, password_).errors,
+            "zep: there is no password in " + absent + "\n");
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", File("password", "zeppass1\n")}).errors,
+            "zep: host: " + kNothing + "\n");
+  EXPECT_EQ(Run({"host", "--user", "u"}, {{"ZEP_BMC_PASSWORD", ""}}).errors, "zep: host: " + kNothing + "\n")
+      << "an empty one is one";
+}
+
+TEST_F(ZepRemoteTest, ADebugLogIsWarnedOf) {
+  std::string const log = zep_.Path("log");
+  TRun const run = Run({"host", "--user", "u", "--debug-log", log}, password_);
+  EXPECT_THAT(run.errors,
+              testing::StartsWith("zep: warning: debug lines are logged, and the controller link writes passwords among "
+                                  "them in clear text\n"));
+  EXPECT_THAT(ReadFile(log), HasSubstr("FDR_[Debug] "));
+  EXPECT_EQ((run.errors + run.output + ReadFile(log)).find("zeppass1"), std::string::npos);
+}
+
+// ---- At a terminal ----
+
+struct TSession {
+  int status;
+  std::string shown;
+};
+
+// Runs zep at a terminal of its own and types the text once something is asked.
+TSession TypeAt(TInstallation const& zep, std::string const& typed) {
+  std::string const program = zep.Path("bin/zep");
+  int terminal = -1;
+  pid_t const child = ::forkpty(&terminal, nullptr, nullptr, nullptr);
+  if (child == 0) {
+    ::unsetenv("ZEP_BMC_PASSWORD");
+    ::execl(program.c_str(), "zep", "remote", "host", "--user", "zepadmin", nullptr);
+    ::_exit(127);
+  }
+  TSession session{};
+  bool isTyped = false;
+  char chunk[512];
+  for (ssize_t got = 0; (got = ::read(terminal, chunk, sizeof chunk)) > 0;) {
+    session.shown.append(chunk, static_cast<std::size_t>(got));
+    if (isTyped || session.shown.find(": ") == std::string::npos) continue;
+    isTyped = ::write(terminal, typed.data(), typed.size()) == static_cast<ssize_t>(typed.size());
+  }
+  int status = 0;
+  ::waitpid(child, &status, 0);
+  session.status = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
+  ::close(terminal);
+  return session;
+}
+
+TEST_F(ZepRemoteTest, ThePasswordIsAskedForWithoutEcho) {
+  TSession const session = TypeAt(zep_, "zeppass1\n");
+  EXPECT_EQ(session.status, 1);
+  EXPECT_THAT(session.shown, testing::StartsWith("Password of zepadmin: \r\nRemote server"));
+  EXPECT_THAT(session.shown, HasSubstr("zep: host: " + kNothing));
+  EXPECT_EQ(session.shown.find("zeppass1"), std::string::npos);
+}
+
+TEST_F(ZepRemoteTest, AnInterruptInsteadOfThePasswordEndsIt) {
+  TSession const session = TypeAt(zep_, "zepp\x03");
+  EXPECT_EQ(session.status, 1);
+  EXPECT_EQ(session.shown, "Password of zepadmin: \r\nzep: no password was given\r\n");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

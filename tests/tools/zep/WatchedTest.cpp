@@ -1,0 +1,119 @@
+#include "tools/zep/Watched.h"
+
+#include "TZEPException.h"
+#include "tests/Support.h"
+
+#include <fcntl.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <chrono>
+#include <csignal>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+TEST(RunWatchedTest, WhatATransferThrowsIsTheOutcome) {
+  struct TRow {
+    std::function<TZEPStatusCode()> transfer;
+    EExitStatus exit;
+    char const* reason;
+  };
+  auto const Log = [](char const* message) { TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, message); };
+  auto const Thrown = [Log](EZEPStatusCode status, char const* message) {
+    return [=]() -> TZEPStatusCode {
+      Log(message);
+      throw TZEPException(status);
+    };
+  };
+  TRow const rows[] = {
+      {[] { return kZEPStatusOK; }, kExitComplete, ""},
+      {Thrown(kZEPStatusConnectionFailed, "TOSSpecific|CurlTransferFile: Error connecting to Server"), kExitNoConnection,
+       "Error connecting to Server"},
+      {Thrown(kZEPStatusLibCurlFailure, "TOSSpecific|CurlTransferFile: Error initalizing curl"), kExitNoLibrary,
+       "Error initalizing curl"},
+      {Thrown(kZEPStatusAccessDenied, "TOSSpecific|CurlTransferFile: Error performing command: a\x1b[1m topsecret b"),
+       kExitNothing, "Error performing command: a\\x1b[1m *** b"},
+      {Thrown(kZEPStatusFail, "of another kind: x"), kExitNothing, "of another kind: x"},
+      {[]() -> TZEPStatusCode { throw std::runtime_error("no luck"); }, kExitNothing, "no luck"},
+      {[]() -> TZEPStatusCode { throw TZEPException(kZEPStatusFileSystemError); }, kExitNothing, "kZEPStatusFileSystemError"},
+      {[] { return kZEPStatusConnectionFailed; }, kExitNoConnection, "kZEPStatusConnectionFailed"},
+      {[]() -> TZEPStatusCode {
+         ::raise(SIGKILL);
+         return kZEPStatusOK;
+       },
+       kExitNothing, "the process of the transfer died"},
+  };
+  Log("an error before the transfer");
+  TWatch watch;
+  watch.fSecret = "topsecret";
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.reason);
+    TOutcome const outcome = RunWatched(row.transfer, watch);
+    EXPECT_EQ(outcome.fExit, row.exit);
+    EXPECT_EQ(outcome.fReason, row.reason);
+  }
+}
+
+TEST(RunWatchedTest, TheTransferReadsNoInputAndPrintsNothing) {
+  testing::internal::CaptureStdout();
+  TOutcome const outcome = RunWatched(
+      [] {
+        char byte;
+        std::puts("printed");
+        std::fflush(stdout);
+        return ::read(STDIN_FILENO, &byte, 1) == 0 ? kZEPStatusOK : kZEPStatusFail;
+      },
+      TWatch());
+  EXPECT_EQ(outcome.fExit, kExitComplete);
+  EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
+}
+
+// The position in a file that is read, and the size of one that is written.
+TEST(RunWatchedTest, MovementIsSeenOnTheFile) {
+  TTempDir const dir;
+  for (bool const isUpload : {true, false}) {
+    SCOPED_TRACE(isUpload);
+    WriteFile(dir.Path("f"), std::string(1000, 'x'));
+    std::uint64_t seen = 0;
+    TWatch watch;
+    watch.fFile = dir.Path("f");
+    watch.fIsUpload = isUpload;
+    watch.fStallSeconds = 2;
+    watch.fShowProgress = [&seen](std::uint64_t bytes) { seen = bytes; };
+    // Six steps of half a second: longer than the standstill that is allowed.
+    TOutcome const outcome = RunWatched(
+        [&] {
+          int const file = ::open(watch.fFile.c_str(), isUpload ? O_RDONLY : O_WRONLY | O_APPEND);
+          char bytes[100] = "";
+          for (int steps = 0; steps < 6; ++steps, ::usleep(500000))
+            if ((isUpload ? ::read(file, bytes, sizeof bytes) : ::write(file, bytes, sizeof bytes)) != sizeof bytes)
+              return kZEPStatusFail;
+          return kZEPStatusOK;
+        },
+        watch);
+    EXPECT_EQ(outcome.fExit, kExitComplete);
+    EXPECT_EQ(seen, isUpload ? 600u : 1600u);
+  }
+}
+
+TEST(RunWatchedTest, AStandstillEndsTheTransfer) {
+  TTempDir const dir;
+  TWatch watch;
+  watch.fFile = dir.Path("f");
+  watch.fStallSeconds = 1;
+  auto const start = std::chrono::steady_clock::now();
+  TOutcome const outcome = RunWatched(
+      [&] {
+        ::sleep(60);
+        return kZEPStatusOK;
+      },
+      watch);
+  EXPECT_EQ(outcome.fExit, kExitStalled);
+  EXPECT_EQ(outcome.fReason, "nothing moved for 1 s");
+  EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(30));
+  EXPECT_EQ(::waitpid(-1, nullptr, WNOHANG), -1) << "no child is left";
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,96 @@
+#include "Controller.h"
+
+#include "IIPMILan.h"
+#include "TOSSpecific.h"
+#include "Text.h"
+
+#include <chrono>
+#include <cstdio>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+using TClock = std::chrono::steady_clock;
+
+constexpr char kEnd = '\0';  // of each field in what a process says
+
+// The text up to its first zero byte, without blanks at its end.
+std::string Field(std::string const& text) {
+  std::string const field = text.substr(0, text.find('\0'));
+  return field.substr(0, field.find_last_not_of(' ') + 1);
+}
+
+bool IsTold(std::string const& field) { return !field.empty() && field != "N/A"; }
+
+std::string WithoutASession(TClock::time_point start) {
+  char seconds[32];
+  std::snprintf(seconds, sizeof seconds, "%.1f s", std::chrono::duration<double>(TClock::now() - start).count());
+  return "no session with its controller after " + std::string(seconds) +
+         ": it gave no answer or refused the account, or libipmiClient.so is missing";
+}
+
+std::string TakeField(std::string& said) {
+  std::size_t const end = said.find(kEnd);
+  std::string field = said.substr(0, end);
+  said.erase(0, end == said.npos ? end : end + 1);
+  return field;
+}
+
+TJson OrNull(std::string const& field) { return field.empty() ? TJson(nullptr) : TJson(field); }
+
+std::string OrUnknown(std::string const& field) { return field.empty() ? "unknown" : field; }
+
+}  // namespace
+
+std::string AskController(std::string const& host, TAccount const& account) {
+  auto const start = TClock::now();
+  std::string const type = Field(TOSSpecific::GetRemoteMT(host, account.fUser, account.fPassword));
+  if (type.empty()) return std::string(3, kEnd) + WithoutASession(start) + kEnd;
+  std::string const model = Field(TOSSpecific::GetRemoteMachineModel(host, account.fUser, account.fPassword));
+  std::string const serialNumber = Field(TOSSpecific::GetRemoteMSN(host, account.fUser, account.fPassword));
+  IIPMILan::GetInstance()->IpmilanCloseConnect();
+
+  std::string said, error;
+  for (std::string const& field : {type, model, serialNumber}) {
+    said += (IsTold(field) ? field : "") + kEnd;
+    if (!IsTold(field)) error = "the controller did not tell everything";
+  }
+  return said + error + kEnd;
+}
+
+TRemoteIdentity IdentityFrom(std::string const& host, std::string const& said, bool isComplete) {
+  TRemoteIdentity identity;
+  identity.fHost = host;
+  std::string rest = isComplete ? said : "";
+  for (std::string* field : {&identity.fType, &identity.fModel, &identity.fSerialNumber, &identity.fError})
+    *field = TakeField(rest);
+  if (!isComplete) identity.fError = "the process that asked its controller did not come to its end";
+  return identity;
+}
+
+bool IsComplete(TRemoteIdentity const& identity) { return identity.fError.empty(); }
+
+bool IsNothing(TRemoteIdentity const& identity) {
+  return identity.fType.empty() && identity.fModel.empty() && identity.fSerialNumber.empty();
+}
+
+TJson AsJson(TRemoteIdentity const& identity) {
+  TJson json = {{"host", identity.fHost},
+                {"type", OrNull(identity.fType)},
+                {"model", OrNull(identity.fModel)},
+                {"serialNumber", OrNull(identity.fSerialNumber)}};
+  if (!identity.fError.empty()) json["error"] = identity.fError;
+  return json;
+}
+
+std::string AsText(TRemoteIdentity const& identity) {
+  TTable table({15, 61});
+  table.Add({"Remote server", identity.fHost});
+  table.Add({"Machine type", OrUnknown(identity.fType)});
+  table.Add({"Model", OrUnknown(identity.fModel)});
+  table.Add({"Serial number", OrUnknown(identity.fSerialNumber)});
+  return table.GetText();
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,130 @@
+// zep media: the removable media of this machine.
+
+#include "Commands.h"
+#include "ExitStatus.h"
+#include "Json.h"
+#include "Media.h"
+#include "Output.h"
+#include "TMountedMedium.h"
+#include "Text.h"
+
+#include <CLI/CLI.hpp>
+
+#include <cstdio>
+#include <iostream>
+#include <memory>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  bool fAsJson = false;
+  std::string fDevice;     // to mount
+  std::string fDirectory;  // to unmount
+};
+
+// "4 MiB", "7.5 GiB": at most one digit behind the point, cut off there.
+std::string AsSize(std::uint64_t bytes) {
+  constexpr char const* units[] = {"KiB", "MiB", "GiB", "TiB"};
+  std::uint64_t tenths = bytes * 10 / 1024;
+  std::size_t unit = 0;
+  for (; unit + 1 < std::size(units) && tenths >= 10240; ++unit) tenths /= 1024;
+  std::string const digit = tenths % 10 == 0 ? "" : "." + std::to_string(tenths % 10);
+  return std::to_string(tenths / 10) + digit + " " + units[unit];
+}
+
+TJson SizeAsJson(std::uint64_t size) { return size == 0 ? TJson(nullptr) : TJson(size); }
+
+std::string OrDash(std::string const& text) { return text.empty() ? "-" : text; }
+
+std::string MountedAt(TMedium const& medium) {
+  std::string text;
+  for (std::string const& mountPoint : medium.fMountPoints) text += (text.empty() ? "" : " ") + mountPoint;
+  return OrDash(text) + (medium.fIsReadOnly ? " (read-only)" : "");
+}
+
+std::string AsText(std::vector<TMedium> const& media) {
+  TTable table({12, 9, 11, 11, 12, 15});
+  table.Add({"Device", "Size", "Label", "File system", "Mounted at", "What it is"});
+  for (TMedium const& medium : media)
+    table.Add({medium.fDevice, medium.fSize == 0 ? "-" : AsSize(medium.fSize), OrDash(medium.fLabel), OrDash(medium.fFileSystem),
+               MountedAt(medium), OrDash(medium.fDescription)});
+  return table.GetText();
+}
+
+TJson OrNull(std::string const& text) { return text.empty() ? TJson(nullptr) : TJson(text); }
+
+std::string AsJson(std::vector<TMedium> const& media) {
+  TJson document = DocumentHead("zep media");
+  document["labelsReadable"] = AreLabelsReadable();
+  document["media"] = TJson::array();
+  for (TMedium const& medium : media)
+    document["media"].push_back({{"device", medium.fDevice},
+                                 {"description", OrNull(medium.fDescription)},
+                                 {"size", SizeAsJson(medium.fSize)},
+                                 {"label", OrNull(medium.fLabel)},
+                                 {"fileSystem", OrNull(medium.fFileSystem)},
+                                 {"readOnly", medium.fIsReadOnly},
+                                 {"mounted", !medium.fMountPoints.empty()},
+                                 {"mountPoints", medium.fMountPoints}});
+  return zep::AsText(document);
+}
+
+int List(bool asJson) {
+  std::vector<TMedium> const media = FindMedia();
+  if (!media.empty() || asJson) WriteOutput(asJson ? AsJson(media) : AsText(media));
+  if (media.empty()) {
+    std::cerr << "zep: there is no removable medium\n";
+    return kExitNothing;
+  }
+  if (AreLabelsReadable()) return kExitComplete;
+  std::cerr << "zep: labels and file systems can be read by root only\n";
+  return kExitPartial;
+}
+
+int Mount(std::string const& device, bool asJson) {
+  TMountedMedium const medium(device);
+  TJson document = DocumentHead("zep media mount");
+  document["device"] = medium.Device();
+  document["mountPoint"] = medium.MountPoint();
+  WriteOutput(asJson ? zep::AsText(document) : medium.Device() + " is mounted at " + medium.MountPoint() + "\n");
+  return kExitComplete;
+}
+
+int Unmount(std::string const& directory, bool asJson) {
+  UnmountDirectory(directory);
+  TJson document = DocumentHead("zep media umount");
+  document["mountPoint"] = directory;
+  WriteOutput(asJson ? zep::AsText(document) : directory + " is unmounted; the medium can be taken out\n");
+  return kExitComplete;
+}
+
+int Media(TArguments const& arguments) {
+  if (!arguments.fDevice.empty()) return Mount(arguments.fDevice, arguments.fAsJson);
+  if (!arguments.fDirectory.empty()) return Unmount(arguments.fDirectory, arguments.fAsJson);
+  return List(arguments.fAsJson);
+}
+
+}  // namespace
+
+TRun AddMediaArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  CLI::App* const list = command.add_subcommand("list", "List them, which is also done without a word");
+  CLI::App* const mount = command.add_subcommand("mount", "Mount one at /mnt/key, a floppy at /mnt/floppy");
+  CLI::App* const unmount = command.add_subcommand("umount", "Unmount one, so that it can be taken out");
+  mount->add_option("device", arguments->fDevice, "The device, such as /dev/sdb; its first partition is tried as well")
+      ->required();
+  unmount->add_option("directory", arguments->fDirectory, "Where it is mounted")->required();
+  for (CLI::App* const each : {&command, list, mount, unmount})
+    each->add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  command.require_subcommand(0, 1);
+  command.footer(
+      "Listed are USB disks, floppies and CD-ROMs with a medium, as lsblk shows them. Mounting needs root.\n"
+      "Exit status: 0 when it was done, 2 when labels are missing from the list, 1 when there is no medium or it could\n"
+      "not be done, 64 for wrong usage, which a name with other characters than letters, digits, \"/\", \"-\", \"_\" and\n"
+      "\".\" is, or a device that is not below /dev, or a directory that is not below /mnt, /media or /run/media.");
+  return [arguments] { return Media(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,118 @@
+#include "PacFile.h"
+
+#include "TOSSpecific.h"
+
+#include <dlfcn.h>
+#include <strings.h>
+
+#include <array>
+#include <cstring>
+#include <memory>
+#include <vector>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+constexpr std::size_t kMostBytes = 1 << 20;
+
+// Options of libcurl, whose numbers are fixed.
+constexpr int kTimeout = 13, kFailOnError = 45, kFollowLocation = 52, kMaxRedirects = 68, kConnectTimeout = 78, kNoSignal = 99,
+              kProtocols = 181, kRedirectProtocols = 182, kWriteData = 10001, kUrl = 10002, kErrorBuffer = 10010,
+              kNoProxy = 10177, kWriteFunction = 20011;
+constexpr long kHttp = 1;
+constexpr long kInitAll = 3;
+
+// The functions of libcurl that are used; libcurl.so is not linked.
+struct TCurl {
+  std::unique_ptr<void, int (*)(void*)> fLibrary{nullptr, ::dlclose};
+  int (*fGlobalInit)(long) = nullptr;
+  void* (*fInit)() = nullptr;
+  int (*fSetOption)(void*, int, ...) = nullptr;
+  int (*fPerform)(void*) = nullptr;
+  void (*fCleanup)(void*) = nullptr;
+  void (*fGlobalCleanup)() = nullptr;
+};
+
+std::vector<std::string> LibraryNames() {
+  std::string const root = TOSSpecific::GetZEPRootPath();
+  return {root + "/libcurl.so", root + "/libcurl.so.4", "libcurl.so", "libcurl.so.4", "libcurl.so.3", "libcurl.so.2"};
+}
+
+template <class TFunction>
+bool Find(void* library, char const* name, TFunction*& function) {
+  function = reinterpret_cast<TFunction*>(::dlsym(library, name));
+  return function != nullptr;
+}
+
+// False, with the loader's reason, when there is no libcurl that can be used.
+bool Load(TCurl& curl, std::string& failure) {
+  for (std::string const& name : LibraryNames()) {
+    curl.fLibrary.reset(::dlopen(name.c_str(), RTLD_LAZY));
+    if (curl.fLibrary) break;
+  }
+  void* const library = curl.fLibrary.get();
+  bool const isWhole = library != nullptr && Find(library, "curl_global_init", curl.fGlobalInit) &&
+                       Find(library, "curl_easy_init", curl.fInit) && Find(library, "curl_easy_setopt", curl.fSetOption) &&
+                       Find(library, "curl_easy_perform", curl.fPerform) && Find(library, "curl_easy_cleanup", curl.fCleanup) &&
+                       Find(library, "curl_global_cleanup", curl.fGlobalCleanup);
+  if (isWhole) return true;
+  char const* const reason = ::dlerror();
+  failure = std::string("libcurl cannot be loaded: ") + (reason != nullptr ? reason : "no reason given");
+  return false;
+}
+
+// libcurl's write callback. What is too long is refused, which ends the transfer.
+std::size_t Append(char const* bytes, std::size_t size, std::size_t count, void* text) {
+  std::string& all = *static_cast<std::string*>(text);
+  if (all.size() + size * count > kMostBytes) return 0;
+  all.append(bytes, size * count);
+  return size * count;
+}
+
+// Empty, or why the file could not be had.
+std::string Transfer(TCurl const& curl, std::string const& url, std::string& text) {
+  std::unique_ptr<void, void (*)(void*)> const transfer(curl.fInit(), curl.fCleanup);
+  if (!transfer) return "libcurl does not start";
+  std::array<char, 256> error{};
+  void* const handle = transfer.get();
+  curl.fSetOption(handle, kErrorBuffer, error.data());
+  curl.fSetOption(handle, kUrl, url.c_str());
+  curl.fSetOption(handle, kProtocols, kHttp);
+  curl.fSetOption(handle, kRedirectProtocols, kHttp);
+  curl.fSetOption(handle, kFollowLocation, 1L);
+  curl.fSetOption(handle, kMaxRedirects, 5L);
+  curl.fSetOption(handle, kNoProxy, "*");
+  curl.fSetOption(handle, kFailOnError, 1L);
+  curl.fSetOption(handle, kConnectTimeout, 10L);
+  curl.fSetOption(handle, kTimeout, 30L);
+  curl.fSetOption(handle, kNoSignal, 1L);
+  curl.fSetOption(handle, kWriteFunction, &Append);
+  curl.fSetOption(handle, kWriteData, &text);
+  int const code = curl.fPerform(handle);
+  if (code == 0) return "";
+  return error[0] != '\0' ? error.data() : "libcurl ends with code " + std::to_string(code);
+}
+
+bool IsPlainHttp(std::string const& url) { return ::strncasecmp(url.c_str(), "http://", 7) == 0; }
+
+}  // namespace
+
+TPacFile FetchPacFile(std::string const& url) {
+  TPacFile file;
+  if (!IsPlainHttp(url)) {
+    file.fFailure = "only files of plain HTTP are fetched";
+    return file;
+  }
+  TCurl curl;
+  if (!Load(curl, file.fFailure)) return file;
+  if (curl.fGlobalInit(kInitAll) != 0) {
+    file.fFailure = "libcurl does not start";
+    return file;
+  }
+  file.fFailure = Transfer(curl, url, file.fText);
+  curl.fGlobalCleanup();
+  return file;
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,46 @@
+// zep send: a file to an FTP or SFTP server.
+
+#include "Commands.h"
+#include "Transfer.h"
+
+#include <CLI/CLI.hpp>
+
+#include <memory>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  std::string fFile, fTarget, fName;
+  bool fBySftp = false, fAsJson = false;
+  TTransferOptions fOptions;
+};
+
+int Send(TArguments const& arguments) {
+  TTarget const target = TargetOf(arguments.fTarget, arguments.fBySftp);
+  TTransferred const sent = SendFile(arguments.fFile, target, arguments.fName, arguments.fOptions);
+  return TellOf(sent, "zep send", arguments.fAsJson, arguments.fOptions);
+}
+
+}  // namespace
+
+TRun AddSendArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  command.add_option("file", arguments->fFile, "The file to send")->required();
+  command.add_option("target", arguments->fTarget, "ftp://[USER@]HOST[:PORT]/PATH, sftp://..., or [USER@]HOST[:PORT] alone")
+      ->required();
+  command.add_option("--as", arguments->fName,
+                     "The name there, instead of the file's own, for a host or a URL that ends in \"/\"");
+  command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
+  command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  AddTransferOptions(command, arguments->fOptions);
+  command.allow_extras();  // HasExtras refuses them
+  command.footer(
+      "Missing directories are made on the server; a file that is there is overwritten. A host gets the file in the directory\n"
+      "of the user, or, when ZEP_ISBOOTABLE is \"yes\", in hostline/toqrv/vantor/fdr_upload.\n" +
+      TransferHelp() + " 2 when the file changed while it was sent.");
+  return [&command, arguments] { return HasExtras(command) ? kExitUsage : Send(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,76 @@
+#include "SendReport.h"
+
+#include "TOSSpecific.h"
+#include "Text.h"
+
+#include <stdlib.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <ctime>
+#include <filesystem>
+#include <fstream>
+#include <iostream>
+#include <system_error>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+std::string HostName() {
+  char name[256] = "";
+  ::gethostname(name, sizeof name - 1);
+  return name[0] == '\0' ? "unknown" : name;
+}
+
+std::string FileName() {
+  std::time_t const now = std::time(nullptr);
+  std::tm fields{};
+  char time[32];
+  std::strftime(time, sizeof time, "%Y%m%dT%H%M%SZ", ::gmtime_r(&now, &fields));
+  return "zep-report-" + HostName() + "-" + time + ".json";
+}
+
+std::string MakeDirectory() {
+  std::string pattern = (fs::temp_directory_path() / "zep-report.XXXXXX").string();
+  if (::mkdtemp(pattern.data()) == nullptr) throw std::system_error(errno, std::generic_category(), "no temporary directory");
+  return pattern;
+}
+
+void WriteReport(TReport const& report, std::string const& file) {
+  std::ofstream stream(file);
+  stream << ReportAsJson(report);
+  stream.close();
+  if (!stream) throw std::system_error(errno, std::generic_category(), file);
+}
+
+// The file that gzip makes of this one; the file itself when it makes none.
+std::string Packed(std::string const& file) {
+  std::string complaints;
+  if (TOSSpecific::SpawnProcess("gzip", {"-n", file}, complaints, -1) == 0) return file + ".gz";
+  std::cerr << "zep: the report could not be packed: " << Printable(complaints) << "\n";
+  return file;
+}
+
+}  // namespace
+
+EExitStatus SendReport(TReport const& report, TTarget const& target, TTransferOptions const& options) {
+  std::string const directory = MakeDirectory(), file = directory + "/" + FileName();
+  WriteReport(report, file);
+  std::string const packed = Packed(file);
+  TTransferred const sent = SendFile(packed, target, "", options);
+  if (sent.fOutcome.fExit != kExitComplete) {
+    std::cerr << "zep: " << sent.fUrl << ": " << sent.fOutcome.fReason << "\nzep: the report is kept in " << Printable(packed)
+              << "\n";
+    return sent.fOutcome.fExit;
+  }
+  if (!options.fQuiet)
+    std::cerr << "zep: sent to " << sent.fUrl << ": " << sent.fBytes << " bytes, SHA-256 " << sent.fSha256 << "\n";
+  std::error_code ignored;
+  fs::remove_all(directory, ignored);
+  return report.fStatus;
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,160 @@
+#include "TMountedMedium.h"
+
+#include "Failure.h"
+#include "TOSSpecific.h"
+#include "TZEPException.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <stdexcept>
+#include <system_error>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+class TFile {
+public:
+  TFile(int directory, std::string const& name, int flags) : fFd(::openat(directory, name.c_str(), flags | O_CLOEXEC, 0644)) {}
+  ~TFile() {
+    if (fFd >= 0) ::close(fFd);
+  }
+  TFile(TFile const&) = delete;
+  TFile& operator=(TFile const&) = delete;
+
+  int Get() const { return fFd; }
+
+private:
+  int fFd;
+};
+
+[[noreturn]] void Throw(std::string const& what) { throw std::runtime_error(what); }
+
+void ThrowIf(bool hasFailed, std::string const& what) {
+  if (hasFailed) throw std::runtime_error(what + ": " + std::generic_category().message(errno));
+}
+
+// ---- Mounting ----
+
+std::string MountPointOf(std::string const& device) {
+  bool const isFloppy = device == "/dev/floppy" || device == "/dev/fd0" || device == "/dev/fd1";
+  return isFloppy ? "/mnt/floppy" : "/mnt/key";
+}
+
+// The number of a block device; 0 for what is none.
+std::uint64_t NumberOf(std::string const& path) {
+  struct stat status;
+  return ::stat(path.c_str(), &status) == 0 && S_ISBLK(status.st_mode) ? status.st_rdev : 0;
+}
+
+// Whether the mount is that of the device, or of its first partition. Some file systems mount under numbers of their own.
+bool IsOf(TMount const& mount, std::string const& device) {
+  std::uint64_t const source = NumberOf(mount.fSource);
+  for (std::string const& node : {device, device + "1"}) {
+    std::uint64_t const number = NumberOf(node);
+    if (number != 0 && (number == mount.fDevice || number == source)) return true;
+  }
+  return false;
+}
+
+void RefuseOther(std::optional<TMount> const& mount, std::string const& mountPoint, std::string const& device) {
+  if (mount && !IsOf(*mount, device)) Throw(mountPoint + " holds " + mount->fSource + "; unmount that first");
+}
+
+TMount MountOrThrow(std::string const& device, std::string const& mountPoint) {
+  RefuseOther(MountAt(mountPoint), mountPoint, device);
+  if (!TOSSpecific::IsAdmin()) Throw("only root can mount " + device);
+  try {
+    if (!TOSSpecific::DirExists(mountPoint)) TOSSpecific::CreateDir(mountPoint);
+  } catch (TZEPException const& failure) {
+    Throw("the directory " + mountPoint + " cannot be made: " + failure.what());
+  }
+  try {
+    TOSSpecific::MountDevice(device);
+  } catch (TZEPException const&) {
+    Throw(device + " cannot be mounted: neither it nor " + device + "1 has a file system that can be read");
+  }
+  std::optional<TMount> const mount = MountAt(mountPoint);
+  if (!mount) Throw(device + " was not mounted: a mount point whose name ends in " + mountPoint + " is in the way");
+  RefuseOther(mount, mountPoint, device);
+  return *mount;
+}
+
+// Where media are mounted; nothing else is to be unmounted by a slip of the fingers.
+void CheckDirectory(std::string const& directory) {
+  auto const isBelow = [&](char const* place) { return directory.rfind(place, 0) == 0; };
+  if (IsPlainPath(directory) && (isBelow("/mnt/") || isBelow("/media/") || isBelow("/run/media/"))) return;
+  throw TWrongUsage("\"" + directory +
+                    "\" is no mount point of a medium: below /mnt, /media or /run/media, of letters, digits, " +
+                    "\"/\", \"-\", \"_\" and \".\"");
+}
+
+// ---- Writing ----
+
+void WriteAll(int fd, std::string const& contents, std::string const& what) {
+  for (std::size_t done = 0; done < contents.size();) {
+    ssize_t const count = ::write(fd, contents.data() + done, contents.size() - done);
+    if (count < 0 && errno == EINTR) continue;
+    ThrowIf(count < 0, what);
+    done += static_cast<std::size_t>(count);
+  }
+}
+
+// Some file systems cannot be asked to sync a directory; syncing the whole of them then has to do.
+void SyncDirectory(int directory, std::string const& what) {
+  ThrowIf(::fsync(directory) != 0 && errno != EINVAL, what);
+  ThrowIf(::syncfs(directory) != 0, what);
+}
+
+}  // namespace
+
+TMountedMedium::TMountedMedium(std::string const& device) {
+  CheckDevice(device);
+  fMountPoint = MountPointOf(device);
+  fMount = MountOrThrow(device, fMountPoint);
+}
+
+void TMountedMedium::Write(std::string const& name, std::string const& contents) const {
+  std::string const what = name + " cannot be written on " + Device();
+  if (fMount.fIsReadOnly) Throw(what + ": the medium is read-only");
+  TFile const directory(AT_FDCWD, fMountPoint, O_RDONLY | O_DIRECTORY);
+  ThrowIf(directory.Get() < 0, what);
+
+  // Under another name at first, so that a medium that is pulled out never bears half a file under this one.
+  std::string const draft = name + ".part";
+  std::string present = draft;
+  TFile const file(directory.Get(), draft, O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW);
+  ThrowIf(file.Get() < 0, what);
+  try {
+    WriteAll(file.Get(), contents, what);
+    ThrowIf(::fsync(file.Get()) != 0, what);
+    ThrowIf(::renameat2(directory.Get(), draft.c_str(), directory.Get(), name.c_str(), RENAME_NOREPLACE) != 0, what);
+    present = name;
+    SyncDirectory(directory.Get(), what);
+  } catch (std::runtime_error const&) {
+    ::unlinkat(directory.Get(), present.c_str(), 0);
+    throw;
+  }
+}
+
+void UnmountDirectory(std::string const& directory) {
+  CheckDirectory(directory);
+  std::optional<TMount> const mount = MountAt(directory);
+  if (!mount) Throw("nothing is mounted at " + directory);
+  if (!TOSSpecific::IsAdmin()) Throw("only root can unmount " + directory);
+
+  // Opened before: it then tells of what could not be written while unmounting.
+  TFile const source(AT_FDCWD, mount->fSource, O_RDONLY | O_NONBLOCK);
+  try {
+    TOSSpecific::UnmountDevice(mount->fSource, directory);
+  } catch (TZEPException const&) {
+    Throw(directory + " cannot be unmounted: something still uses it");
+  }
+  if (source.Get() >= 0) ThrowIf(::fsync(source.Get()) != 0, mount->fSource + " is unmounted, but was not written to its end");
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,272 @@
+#include "Transfer.h"
+
+#include "Failure.h"
+#include "Output.h"
+#include "Sha256.h"
+#include "TOSSpecific.h"
+#include "Text.h"
+
+#include <fcntl.h>
+#include <linux/fs.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <CLI/CLI.hpp>
+
+#include <cerrno>
+#include <chrono>
+#include <cstdio>
+#include <filesystem>
+#include <iostream>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+std::string ReasonOf(int error) { return std::generic_category().message(error); }
+
+// ---- Progress ----
+
+std::string SizeText(std::uint64_t bytes) {
+  char const* const units[] = {"B", "KiB", "MiB", "GiB", "TiB"};
+  double size = static_cast<double>(bytes);
+  std::size_t unit = 0;
+  for (; size >= 1024 && unit < 4; ++unit) size /= 1024;
+  char text[32];
+  std::snprintf(text, sizeof text, unit == 0 ? "%.0f %s" : "%.1f %s", size, units[unit]);
+  return text;
+}
+
+// One line on the terminal of standard error, written over and over, and gone at the end.
+class TProgress {
+public:
+  TProgress(std::uint64_t total, bool isWanted) : fTotal(total), fIsShown(isWanted && ::isatty(STDERR_FILENO)) {}
+  ~TProgress() {
+    if (fIsShown) std::cerr << "\r\x1b[K" << std::flush;
+  }
+  TProgress(TProgress const&) = delete;
+  TProgress& operator=(TProgress const&) = delete;
+
+  void Show(std::uint64_t bytes) {
+    if (!fIsShown) return;
+    double const seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - fStart).count();
+    std::string line = "\r\x1b[K";
+    if (fTotal > 0) line += Bar(bytes) + " of " + SizeText(fTotal) + ", ";
+    line += SizeText(bytes) + ", " + SizeText(static_cast<std::uint64_t>(static_cast<double>(bytes) / seconds)) + "/s";
+    std::cerr << line << std::flush;
+  }
+
+private:
+  std::string Bar(std::uint64_t bytes) const {
+    constexpr std::uint64_t kWidth = 30;
+    std::uint64_t const share = std::min(bytes, fTotal);
+    std::string bar(share * kWidth / fTotal, '#');
+    bar.resize(kWidth, '.');
+    return "[" + bar + "] " + std::to_string(share * 100 / fTotal) + " %";
+  }
+
+  std::uint64_t fTotal;  // 0: not known
+  bool fIsShown;
+  std::chrono::steady_clock::time_point fStart = std::chrono::steady_clock::now();
+};
+
+TOutcome Transfer(std::function<TZEPStatusCode()> const& transfer, TTransferred const& transferred, std::string const& password,
+                  bool isUpload, TTransferOptions const& options) {
+  TProgress progress(isUpload ? transferred.fBytes : 0, !options.fQuiet);
+  TWatch watch{transferred.fFile, isUpload, password, options.fStallSeconds, {}};
+  watch.fShowProgress = [&progress](std::uint64_t bytes) { progress.Show(bytes); };
+  return RunWatched(transfer, watch);
+}
+
+TTransferred TransferOf(TRemote const& remote, std::string const& file) {
+  TTransferred transferred;
+  transferred.fUrl = ShownUrlOf(remote);
+  transferred.fFile = file;
+  return transferred;
+}
+
+TTransferred Failed(TTransferred transferred, EExitStatus exit, std::string const& reason) {
+  transferred.fOutcome = {kZEPStatusFail, exit, reason};
+  return transferred;
+}
+
+// ---- Sending ----
+
+// Why a file cannot be sent; empty when it can.
+std::string WhyNotReadable(std::string const& file, struct stat& status) {
+  if (::stat(file.c_str(), &status) != 0) return ReasonOf(errno);
+  if (!S_ISREG(status.st_mode)) return "it is no regular file";
+  return ::access(file.c_str(), R_OK) == 0 ? "" : ReasonOf(errno);
+}
+
+bool IsSame(struct stat const& a, struct stat const& b) {
+  return a.st_ino == b.st_ino && a.st_size == b.st_size && a.st_mtim.tv_sec == b.st_mtim.tv_sec &&
+         a.st_mtim.tv_nsec == b.st_mtim.tv_nsec;
+}
+
+void AddName(TRemote& remote, std::string const& name) {
+  if (remote.fPath.empty() || remote.fPath.back() == '/') remote.fPath += EncodedName(name);
+}
+
+TZEPStatusCode Send(std::string const& file, TTarget const& target) {
+  std::string const host = AuthorityOf(target.fRemote);
+  if (!target.fIsHost)
+    TOSSpecific::CurlTransferFile(UrlOf(target.fRemote), file, false);
+  else if (target.fRemote.fScheme == "sftp")
+    TOSSpecific::sFTPFile(host, file, target.fRemote.fPath);
+  else
+    TOSSpecific::FTPFile(host, file, target.fRemote.fPath);
+  return kZEPStatusOK;
+}
+
+// ---- Fetching ----
+
+// Gives the file its name, in place of another one only when that is wanted.
+bool Rename(std::string const& from, std::string const& to, bool overwrites) {
+  if (overwrites) return std::rename(from.c_str(), to.c_str()) == 0;
+  if (::renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0) return true;
+  if (errno != EINVAL) return false;  // that a file system knows no such renaming
+  return !fs::exists(to) && std::rename(from.c_str(), to.c_str()) == 0;
+}
+
+bool MakeEmptyFile(std::string const& path) {
+  int const file = ::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL, 0666);
+  return file >= 0 && ::close(file) == 0;
+}
+
+// Whether more could be written to the file. False, with errno set, on a full disk.
+bool CanGrow(std::string const& path) {
+  int const file = ::open(path.c_str(), O_WRONLY | O_APPEND);
+  if (file < 0) return errno == ENOENT;
+  off_t const size = ::lseek(file, 0, SEEK_END);
+  char const block[4096] = "";
+  errno = ENOSPC;  // for a write that is cut short
+  bool const isWritten = ::write(file, block, sizeof block) == static_cast<ssize_t>(sizeof block);
+  int const error = errno;
+  bool const isAsBefore = ::ftruncate(file, size) == 0;
+  ::close(file);
+  errno = error;
+  return isWritten && isAsBefore;
+}
+
+// Makes a failed transfer one of the local disk, when that is the cause.
+void BlameTheDisk(TOutcome& outcome, std::string const& part) {
+  if (outcome.fExit != kExitNothing || CanGrow(part)) return;
+  outcome.fExit = kExitNotWritten;
+  outcome.fReason = ReasonOf(errno);
+}
+
+// What there is of a file that did not arrive.
+std::string PartText(std::string const& part) {
+  std::error_code absent;
+  std::uintmax_t const size = fs::file_size(part, absent);
+  return absent ? "; nothing arrived" : "; the " + SizeText(size) + " that arrived are in " + Printable(part);
+}
+
+}  // namespace
+
+void AddTransferOptions(CLI::App& command, TTransferOptions& options) {
+  command.add_flag("--quiet", options.fQuiet, "No progress, and no word when all went well");
+  command.add_option("--stall", options.fStallSeconds, "The longest standstill allowed, in seconds (60); 0 waits for ever")
+      ->check(CLI::Range(0, 86400));
+  command.add_option("--netrc", options.fNetrc, "The file with users and passwords ($NETRC, else ~/.netrc)");
+}
+
+bool HasExtras(CLI::App const& command) {
+  if (command.remaining().empty()) return false;
+  std::cerr << "zep: there are arguments too many, or options that do not exist\n";
+  return true;
+}
+
+std::string TransferHelp() {
+  return "Passwords come from the URL (which other users may see in the list of processes), from netrc, or from a prompt.\n"
+         "In the path of a URL blanks and the like may be written as they are; \"%20\" stays what it is.\n"
+         "Exit status: 0 when all went well, 1 when the server refused it or the transfer broke off, 64 for wrong usage,\n"
+         "66 when the file to be sent cannot be read, 68 when the host is unknown or nobody answers, 69 without libcurl,\n"
+         "73 when the local file exists or cannot be written, 75 when nothing moved for too long.";
+}
+
+TTarget TargetOf(std::string const& text, bool bySftp) {
+  bool const isUrl = text.find("://") != text.npos;
+  TTarget target{RemoteOf(text, bySftp ? "sftp" : "ftp"), !isUrl};
+  if (target.fRemote.fScheme != "ftp" && target.fRemote.fScheme != "sftp") throw TWrongUsage("only ftp:// and sftp:// are known");
+  if (target.fIsHost && !target.fRemote.fPath.empty()) throw TWrongUsage("a host has no path; write a URL");
+  return target;
+}
+
+TTransferred SendFile(std::string const& file, TTarget target, std::string const& name, TTransferOptions const& options) {
+  AddName(target.fRemote, name.empty() ? fs::path(file).filename().string() : name);
+  TTransferred transferred = TransferOf(target.fRemote, file);
+  struct stat before, after;
+  std::string const why = WhyNotReadable(file, before);
+  if (!why.empty()) return Failed(transferred, kExitNoInput, why);
+  transferred.fBytes = static_cast<std::uint64_t>(before.st_size);
+
+  FindPassword(target.fRemote, options.fNetrc);
+  transferred.fUrl = ShownUrlOf(target.fRemote);
+  transferred.fOutcome = Transfer([&] { return Send(file, target); }, transferred, target.fRemote.fPassword, true, options);
+  if (transferred.fOutcome.fExit != kExitComplete) {
+    bool const wasReached = transferred.fOutcome.fExit == kExitNothing || transferred.fOutcome.fExit == kExitStalled;
+    if (wasReached) transferred.fOutcome.fReason += "; the server may have a part of it";
+    return transferred;
+  }
+  transferred.fSha256 = Sha256Of(file);
+  if (::stat(file.c_str(), &after) != 0 || !IsSame(before, after))
+    return Failed(transferred, kExitPartial, "the file changed while it was sent");
+  return transferred;
+}
+
+TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, TTransferOptions const& options) {
+  std::string const part = file + ".part";
+  TTransferred transferred = TransferOf(remote, part);
+  FindPassword(remote, options.fNetrc);
+  transferred.fUrl = ShownUrlOf(remote);
+  // A part that an earlier transfer left goes: the library would ask what is to become of it.
+  if (::unlink(part.c_str()) != 0 && errno != ENOENT) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
+  if (!MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
+  ::unlink(part.c_str());
+  transferred.fOutcome = Transfer(
+      [&] {
+        TOSSpecific::CurlTransferFile(UrlOf(remote), part, true);
+        return kZEPStatusOK;
+      },
+      transferred, remote.fPassword, false, options);
+  if (transferred.fOutcome.fExit != kExitComplete) {
+    BlameTheDisk(transferred.fOutcome, part);
+    transferred.fOutcome.fReason += PartText(part);
+    return transferred;
+  }
+  // An empty file does not arrive at all.
+  if (!fs::exists(part) && !MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
+  transferred.fBytes = fs::file_size(part);
+  transferred.fSha256 = Sha256Of(part);
+  if (!Rename(part, file, overwrites))
+    return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + ReasonOf(errno));
+  transferred.fFile = file;
+  return transferred;
+}
+
+int TellOf(TTransferred const& transferred, std::string const& command, bool asJson, TTransferOptions const& options) {
+  TOutcome const& outcome = transferred.fOutcome;
+  bool const isComplete = outcome.fExit == kExitComplete;
+  if (asJson) {
+    TJson document = DocumentHead(command);
+    document["url"] = transferred.fUrl;
+    document["file"] = transferred.fFile;
+    document["exitStatus"] = static_cast<int>(outcome.fExit);
+    document["bytes"] = isComplete ? TJson(transferred.fBytes) : TJson(nullptr);
+    document["sha256"] = isComplete ? TJson(transferred.fSha256) : TJson(nullptr);
+    document["reason"] = isComplete ? TJson(nullptr) : TJson(outcome.fReason);
+    WriteOutput(AsText(document));
+  } else if (isComplete && !options.fQuiet) {
+    WriteOutput(transferred.fUrl + ", " + Printable(transferred.fFile) + ": " + std::to_string(transferred.fBytes) +
+                " bytes, SHA-256 " + transferred.fSha256 + "\n");
+  }
+  if (!isComplete)
+    std::cerr << "zep: " << transferred.fUrl << ", " << Printable(transferred.fFile) << ": " << outcome.fReason << "\n";
+  return outcome.fExit;
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,62 @@
+#pragma once
+
+#include "ExitStatus.h"
+#include "Json.h"
+#include "Remote.h"
+#include "Watched.h"
+
+#include <cstdint>
+#include <string>
+
+namespace CLI {
+class App;
+}
+
+namespace NQRVZEP20::zep {
+
+// What every command that transfers files can be told.
+struct TTransferOptions {
+  bool fQuiet = false;  // no progress, and no word when all went well
+  int fStallSeconds = kUsualStallSeconds;
+  std::string fNetrc;
+};
+
+void AddTransferOptions(CLI::App& command, TTransferOptions& options);
+
+// Whether there are arguments that the command does not know, which it says then without showing them: a password may be
+// among them.
+bool HasExtras(CLI::App const& command);
+
+// The end of the help of such a command: passwords, and the exit status for each kind of failure.
+std::string TransferHelp();
+
+// A transfer that has ended.
+struct TTransferred {
+  TOutcome fOutcome;
+  std::string fUrl;  // for people
+  std::string fFile;
+  std::uint64_t fBytes = 0;
+  std::string fSha256;  // of the local file; when all went well
+};
+
+// Where a file is to be sent: a URL (which ends in "/" when the name is still to be added), or a host alone.
+struct TTarget {
+  TRemote fRemote;
+  bool fIsHost;  // the library chooses the directory then
+};
+
+// Of ftp and sftp only. Throws TWrongUsage.
+TTarget TargetOf(std::string const& text, bool bySftp);
+
+// Sends a file under that name ("": its own). A file that changes meanwhile is sent in part.
+TTransferred SendFile(std::string const& file, TTarget target, std::string const& name, TTransferOptions const& options);
+
+// Fetches what the URL names into the file, by way of the file with ".part" behind its name, which stays when the transfer
+// breaks off. `overwrites`: whether a file may be there.
+TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, TTransferOptions const& options);
+
+// Says on standard output, or as one JSON document, what became of a transfer, and on standard error why it failed. Returns
+// its exit status.
+int TellOf(TTransferred const& transferred, std::string const& command, bool asJson, TTransferOptions const& options);
+
+}  // namespace NQRVZEP20::zep

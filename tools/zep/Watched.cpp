@@ -1,0 +1,159 @@
+#include "Watched.h"
+
+#include "ILogger.h"
+#include "TRootObject.h"
+#include "TZEPException.h"
+#include "Text.h"
+
+#include <fcntl.h>
+#include <poll.h>
+#include <signal.h>
+#include <sys/prctl.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <chrono>
+#include <filesystem>
+#include <fstream>
+#include <system_error>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+namespace fs = std::filesystem;
+using TClock = std::chrono::steady_clock;
+
+constexpr int kLookEveryMilliseconds = 100;
+
+EExitStatus ExitStatusOf(TZEPStatusCode const& status) {
+  if (status == kZEPStatusOK) return kExitComplete;
+  if (status == kZEPStatusConnectionFailed) return kExitNoConnection;
+  if (status == kZEPStatusLibCurlFailure) return kExitNoLibrary;
+  return kExitNothing;
+}
+
+// ---- In the child ----
+
+// What the library logged last as an error, less the name of the operation.
+std::string LoggedReason() {
+  ILogger* const logger = TRootObject::GetCoreLogger();
+  if (logger == nullptr || logger->GetLog().empty()) return "";
+  std::string const& message = logger->GetLog().back().fMessage;
+  std::size_t const name = message.find(": ");
+  return message.rfind("TOSSpecific|", 0) == 0 && name != message.npos ? message.substr(name + 2) : message;
+}
+
+// The report of the child: the status as a number, a blank, and the reason.
+std::string ReportOf(std::function<TZEPStatusCode()> const& transfer) {
+  TZEPStatusCode status = kZEPStatusFail;
+  std::string reason;
+  try {
+    status = transfer();
+  } catch (TZEPException const& failure) {
+    status = failure.GetStatusCode();
+  } catch (std::exception const& failure) {
+    reason = failure.what();
+  }
+  if (reason.empty() && status != kZEPStatusOK) reason = LoggedReason();
+  return std::to_string(status.GetCode()) + " " + reason;
+}
+
+[[noreturn]] void RunInChild(std::function<TZEPStatusCode()> const& transfer, int reportEnd) {
+  ::prctl(PR_SET_PDEATHSIG, SIGKILL);  // a transfer does not outlive zep
+  int const nowhere = ::open("/dev/null", O_RDWR);
+  ::dup2(nowhere, STDIN_FILENO);
+  ::dup2(nowhere, STDOUT_FILENO);
+  if (ILogger* const logger = TRootObject::GetCoreLogger()) logger->ClearLog();
+  std::string const report = ReportOf(transfer);
+  bool const isTold = ::write(reportEnd, report.data(), report.size()) == static_cast<ssize_t>(report.size());
+  ::_exit(isTold ? 0 : 1);
+}
+
+// ---- In zep ----
+
+// How far a process has read the file.
+std::uint64_t PositionIn(fs::path const& file, pid_t process) {
+  std::error_code gone;
+  std::uint64_t position = 0;
+  std::string const directory = "/proc/" + std::to_string(process);
+  for (auto entry = fs::directory_iterator(directory + "/fd", gone); !gone && entry != fs::directory_iterator();
+       entry.increment(gone)) {
+    std::error_code closed;
+    if (fs::read_symlink(entry->path(), closed) != file) continue;
+    std::ifstream info(directory + "/fdinfo/" + entry->path().filename().string());
+    std::string word;
+    std::uint64_t number = 0;
+    if (info >> word >> number && word == "pos:") position = std::max(position, number);
+  }
+  return position;
+}
+
+// What moves during a transfer: the position in a file that is sent, the size of one that is fetched.
+std::uint64_t BytesMoved(TWatch const& watch, pid_t process) {
+  std::error_code absent;
+  if (watch.fIsUpload) return PositionIn(fs::canonical(watch.fFile, absent), process);
+  std::uintmax_t const size = fs::file_size(watch.fFile, absent);
+  return absent ? 0 : size;
+}
+
+std::string Without(std::string const& secret, std::string text) {
+  if (secret.empty()) return text;
+  for (std::size_t at = 0; (at = text.find(secret, at)) != text.npos; at += 3) text.replace(at, secret.size(), "***");
+  return text;
+}
+
+TOutcome OutcomeOf(std::string const& report, TWatch const& watch) {
+  std::size_t const blank = report.find(' ');
+  if (blank == report.npos) return {kZEPStatusFail, kExitNothing, "the process of the transfer died"};
+  TZEPStatusCode const status(static_cast<EZEPStatusCode>(std::stoi(report.substr(0, blank))));
+  if (status == kZEPStatusOK) return {status, kExitComplete, ""};
+  std::string const reason = Printable(Without(watch.fSecret, report.substr(blank + 1)));
+  return {status, ExitStatusOf(status), reason.empty() ? status.TranslateStatusCode() : reason};
+}
+
+TOutcome Stalled(TWatch const& watch) {
+  return {kZEPStatusTransferFailure, kExitStalled, "nothing moved for " + std::to_string(watch.fStallSeconds) + " s"};
+}
+
+// Reads the report until the child is done; false when it stood still for too long.
+bool ReadReport(int end, pid_t process, TWatch const& watch, std::string& report) {
+  std::uint64_t last = BytesMoved(watch, process);
+  TClock::time_point lastMoved = TClock::now();
+  pollfd waiting{end, POLLIN, 0};
+  char chunk[4096];
+  while (true) {
+    if (::poll(&waiting, 1, kLookEveryMilliseconds) > 0) {
+      ssize_t const got = ::read(end, chunk, sizeof chunk);
+      if (got <= 0) return true;
+      report.append(chunk, static_cast<std::size_t>(got));
+      continue;
+    }
+    std::uint64_t const now = BytesMoved(watch, process);
+    if (watch.fShowProgress) watch.fShowProgress(now);
+    if (now != last) lastMoved = TClock::now();
+    last = now;
+    if (watch.fStallSeconds > 0 && TClock::now() - lastMoved > std::chrono::seconds(watch.fStallSeconds)) return false;
+  }
+}
+
+}  // namespace
+
+TOutcome RunWatched(std::function<TZEPStatusCode()> const& transfer, TWatch const& watch) {
+  int ends[2];
+  if (::pipe2(ends, O_CLOEXEC) != 0) throw std::system_error(errno, std::generic_category(), "no pipe");
+  pid_t const child = ::fork();
+  if (child < 0) throw std::system_error(errno, std::generic_category(), "no process");
+  if (child == 0) RunInChild(transfer, ends[1]);
+
+  ::close(ends[1]);
+  std::string report;
+  bool const isDone = ReadReport(ends[0], child, watch, report);
+  ::close(ends[0]);
+  if (!isDone) ::kill(child, SIGKILL);
+  ::waitpid(child, nullptr, 0);
+  return isDone ? OutcomeOf(report, watch) : Stalled(watch);
+}
+
+}  // namespace NQRVZEP20::zep
