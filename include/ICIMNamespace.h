@@ -38,6 +38,7 @@ public:
                                                                    unsigned int scope, unsigned int flavor,
                                                                    TCIMContext const& context) = 0;
 
+  // Empty when the name is not declared.
   virtual boost::shared_ptr<ICIMQualifierDecl> GetQualifierDecl(std::string const& name, TCIMContext const& context) const = 0;
 
   // In the order in which they were created.

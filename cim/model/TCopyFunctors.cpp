@@ -110,6 +110,7 @@ TCopyQualifier::TCopyQualifier(boost::weak_ptr<ICIMNamespace> destination, boost
 bool TCopyQualifier::operator()(boost::shared_ptr<ICIMQualifier> qualifier) {
   const TCIMContext none;
   const boost::shared_ptr<ICIMQualifierDecl> declaration = Lock(fDestination)->GetQualifierDecl(qualifier->GetName(none), none);
+  if (!declaration) throw TZEPException(kZEPStatusNotFound);
   fTarget->AddQualifier(declaration, qualifier->GetValue(none), qualifier->GetFlavor(none), none);
   return true;
 }

@@ -224,6 +224,23 @@ TEST_F(TCIMCopyTest, AQualifierThatTheDestinationDoesNotDeclareEndsTheCopyOfACla
   EXPECT_THAT(Names(*copy_->GetClass("X_A", kNone), &ICIMClass::EnumeratePropertyDecls), IsEmpty());
 }
 
+TEST_F(TCIMCopyTest, AnUndeclaredQualifierIsNotAskedFor) {
+  source_->DefineClass("X_A").Description("a");
+  EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_A", kNone), Traced(copy_, "dst")), kZEPStatusNotFound);
+  EXPECT_THAT(trace_.fCalls, ElementsAre("CreateClass dst:X_A", "GetQualifierDecl dst:Description"));
+}
+
+TEST_F(TCIMCopyTest, AnUndeclaredQualifierOfAPropertyLeavesTheDeclarationWithoutItAndOneLine) {
+  source_->DefineClass("X_A").Property("Name", "string").Description("n").Property("Size", "uint64");
+  OnNewThread([&] {
+    const TLogCapture log;
+    TCIMCopy::CopyClass(source_->GetClass("X_A", kNone), copy_);
+    EXPECT_THAT(log.Entries(), ElementsAre(kLine));
+  });
+  EXPECT_THAT(Names(*copy_->GetClass("X_A", kNone), &ICIMClass::EnumeratePropertyDecls), ElementsAre("Name", "Size"));
+  EXPECT_FALSE(Decl(*copy_, "X_A", "Name")->GetQualifier("Description", kNone));
+}
+
 TEST_F(TCIMCopyTest, ACopiedQualifierHasItsValueAndItsOwnFlavor) {
   const auto cls = source_->DefineClass("X_A").Class();
   cls->AddQualifier(source_->GetQualifierDecl("Description", kNone), TCIMValue("a"), ICIMQualifierDecl::kFlavorToSubclass, kNone);

@@ -53,7 +53,7 @@ public:
   }
   boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                 unsigned int flavor, TCIMContext const& context) override {
-    fTrace.Record("AddQualifier " + fPath + " " + declaration->GetName(context), context);
+    fTrace.Record("AddQualifier " + fPath + " " + (declaration ? declaration->GetName(context) : "of no declaration"), context);
     return fInner->AddQualifier(declaration, value, flavor, context);
   }
 
