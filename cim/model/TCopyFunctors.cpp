@@ -183,7 +183,9 @@ bool TCopyInstanceProperty::operator()(boost::shared_ptr<ICIMProperty> property)
   const TCIMContext none;
   const TCIMValue value = property->GetValue(none);
   if (value.IsNull()) return true;
-  fTarget->GetProperty(property->GetName(none), none)->SetValue(TCIMCopy::CopyValue(value, Lock(fDestination)), none);
+  const boost::shared_ptr<ICIMProperty> copy = fTarget->GetProperty(property->GetName(none), none);
+  if (!copy) throw TZEPException(kZEPStatusNotFound);
+  copy->SetValue(TCIMCopy::CopyValue(value, Lock(fDestination)), none);
   return true;
 }
 

@@ -517,10 +517,10 @@ TEST_F(ProductCopyTest, AnInstanceOfAClassThatTheDestinationLacksIsRefused) {
   EXPECT_STATUS(TCIMCopy::CopyInstance(instance, copy_), kZEPStatusNotFound);
 }
 
-TEST_F(ProductCopyTest, APropertyThatTheDestinationLacksIsAFailedAssertion) {
+TEST_F(ProductCopyTest, APropertyThatTheDestinationLacksIsNotFound) {
   const auto instance = source_->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}, {"Version", "1"}});
   copy_->DefineClass("QRVSG_ZEPProduct").Key("Name", "string");
-  EXPECT_STATUS(TCIMCopy::CopyInstance(instance, copy_), kZEPStatusFail);
+  EXPECT_STATUS(TCIMCopy::CopyInstance(instance, copy_), kZEPStatusNotFound);
   EXPECT_THAT(CopiedProducts(), IsEmpty());
 }
 
