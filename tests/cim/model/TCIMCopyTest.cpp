@@ -203,6 +203,22 @@ TEST_F(TCIMCopyTest, ASuperclassThatIsMissingEndsTheCopyOfAClass) {
   source_->DefineClass("X_B", "X_A");
   EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_B", kNone), copy_), kZEPStatusNotFound);
   EXPECT_THAT(ClassNames(*copy_), IsEmpty());
+TEST_F(TCIMCopyTest, AnEmptyAnswerForAClassCountsAsNotFound) {
+  source_->DefineClass("X_A").Key("Id", "uint32");
+  source_->DefineClass("X_B", "X_A");
+  const auto instance = source_->AddInstance("X_A", {{"Id", 1}});
+  TCIMValue nullReference = NullOf("reference");
+  nullReference.SetReferencedClass(source_->GetClass("X_A", kNone));
+  trace_.fAnswersUnknownClassByEmpty = true;
+  const auto destination = Traced(copy_, "dst");
+  EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_B", kNone), destination), kZEPStatusNotFound);
+  EXPECT_STATUS(TCIMCopy::CopyInstance(instance, destination), kZEPStatusNotFound);
+  EXPECT_STATUS(TCIMCopy::CopyValue(nullReference, destination), kZEPStatusNotFound);
+  EXPECT_STATUS(TCIMCopy::CopyValue(instance->GetReference(), destination), kZEPStatusNotFound);
+  EXPECT_THAT(trace_.fCalls, ElementsAre("GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A"));
+  EXPECT_THAT(ClassNames(*copy_), IsEmpty());
+}
+
 }
 
 TEST_F(TCIMCopyTest, ARootClassLooksUpNoSuperclass) {
