@@ -4,8 +4,6 @@
 #include "providers/memory/TMemoryClass.h"
 #include "tests/providers/memory/Collect.h"
 
-#include <boost/thread/recursive_mutex.hpp>
-
 #include <atomic>
 #include <chrono>
 #include <stdexcept>
@@ -203,6 +201,8 @@ TEST_F(TCIMCopyTest, ASuperclassThatIsMissingEndsTheCopyOfAClass) {
   source_->DefineClass("X_B", "X_A");
   EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_B", kNone), copy_), kZEPStatusNotFound);
   EXPECT_THAT(ClassNames(*copy_), IsEmpty());
+}
+
 TEST_F(TCIMCopyTest, AnEmptyAnswerForAClassCountsAsNotFound) {
   source_->DefineClass("X_A").Key("Id", "uint32");
   source_->DefineClass("X_B", "X_A");
@@ -217,8 +217,6 @@ TEST_F(TCIMCopyTest, AnEmptyAnswerForAClassCountsAsNotFound) {
   EXPECT_STATUS(TCIMCopy::CopyValue(instance->GetReference(), destination), kZEPStatusNotFound);
   EXPECT_THAT(trace_.fCalls, ElementsAre("GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A"));
   EXPECT_THAT(ClassNames(*copy_), IsEmpty());
-}
-
 }
 
 TEST_F(TCIMCopyTest, ARootClassLooksUpNoSuperclass) {
