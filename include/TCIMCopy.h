@@ -4,14 +4,11 @@
 #include "ZEPExport.h"
 
 #include <boost/shared_ptr.hpp>
+#include <boost/thread/recursive_mutex.hpp>
 #include <boost/weak_ptr.hpp>
 
 #include <string>
 #include <utility>
-
-namespace boost {
-class recursive_mutex;
-}
 
 namespace NQRVZEP20 {
 
@@ -31,8 +28,10 @@ class TCIMReference;
 // belong to different plug-ins: everything goes through the interfaces, with empty contexts.
 //
 // A property declaration that throws TZEPException is logged, at debug severity, and left out. Any other failure (a class
-// that is there already, a superclass that is not, whatever a plug-in throws) passes through and ends the copy; what was
-// made in the destination by then stays. An empty pointer is a failed assertion. Only CopyInstance takes a lock.
+// that is there already, a superclass that is not, a static value whose declaration was left out, whatever a plug-in throws)
+// passes through and ends the copy; what was made in the destination by then stays. What the destination answers with an
+// empty pointer for counts as kZEPStatusNotFound; an empty pointer that the caller passes is a failed assertion. Only
+// CopyInstance takes a lock.
 class ZEP_EXPORT TCIMCopy {
 public:
   // Qualifier declarations, then the classes whose flag (ICIMClass::GetClassFlag) is not set, then those whose flag is, so
@@ -56,8 +55,12 @@ public:
 
 }  // namespace NQRVZEP20
 
-// Held by CopyInstance.
+// Held by CopyInstance. Whoever keeps instances from being copied for a while holds it, too.
 extern ZEP_EXPORT boost::recursive_mutex copyInstMutex;
+
+namespace NQRVZEP20 {
+using ::copyInstMutex;
+}
 
 // ---- The steps of the copy: callbacks for the enumerations of the source. Each holds where it writes to, and returns true,
 //      so that the enumeration goes on. The namespace is held weakly; once it is gone a step works with an empty pointer. ----

@@ -6,8 +6,7 @@
 #include "ICIMNamespace.h"
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
-
-#include <boost/thread/recursive_mutex.hpp>
+#include "TZEPException.h"
 
 #include <vector>
 
@@ -19,9 +18,16 @@ namespace {
 
 using TType = TCIMValue::TCIMType;
 
+// The class of that name. A namespace may answer an unknown name with an empty pointer, too.
+boost::shared_ptr<ICIMClass> ClassIn(ICIMNamespace const& dst, std::string const& name) {
+  const boost::shared_ptr<ICIMClass> cls = dst.GetClass(name, TCIMContext());
+  if (!cls) throw TZEPException(kZEPStatusNotFound);
+  return cls;
+}
+
 boost::shared_ptr<ICIMClass> SuperClassIn(ICIMNamespace const& dst, ICIMClass const& cls) {
   if (cls.IsRootClass(TCIMContext())) return boost::shared_ptr<ICIMClass>();
-  return dst.GetClass(cls.GetSuperClass(TCIMContext())->GetName(TCIMContext()), TCIMContext());
+  return ClassIn(dst, cls.GetSuperClass(TCIMContext())->GetName(TCIMContext()));
 }
 
 void EndDeclarationsQuietly(ICIMClass& cls) noexcept {
@@ -46,7 +52,7 @@ void CopyPropertyDecls(ICIMClass const& cls, boost::shared_ptr<ICIMClass> copy, 
 // The class of the same name; empty when the value refers to none.
 boost::shared_ptr<ICIMClass> ReferencedClassIn(boost::shared_ptr<ICIMNamespace> dst, TCIMValue const& reference) {
   const boost::shared_ptr<ICIMClass> source = reference.GetReferencedClass();
-  return source ? dst->GetClass(source->GetName(TCIMContext()), TCIMContext()) : source;
+  return source ? ClassIn(*dst, source->GetName(TCIMContext())) : source;
 }
 
 TCIMValue CopyReference(TCIMValue const& v, boost::shared_ptr<ICIMNamespace> dst) {
@@ -92,7 +98,7 @@ void TCIMCopy::CopyClass(boost::shared_ptr<ICIMClass> cls, boost::shared_ptr<ICI
 void TCIMCopy::CopyInstance(boost::shared_ptr<ICIMInstance> inst, boost::shared_ptr<ICIMNamespace> dst) {
   const boost::recursive_mutex::scoped_lock lock(copyInstMutex);
   const std::string className = inst->GetClass(TCIMContext())->GetName(TCIMContext());
-  const boost::shared_ptr<ICIMClass> cls = dst->GetClass(className, TCIMContext());
+  const boost::shared_ptr<ICIMClass> cls = ClassIn(*dst, className);
   const boost::shared_ptr<ICIMInstance> copy = cls->CreateInstance(TCIMContext());
   inst->EnumerateProperties(TCopyInstanceProperty(dst, copy), TCIMContext());
   cls->CommitInstance(copy, TCIMContext());

@@ -110,6 +110,7 @@ TCopyQualifier::TCopyQualifier(boost::weak_ptr<ICIMNamespace> destination, boost
 bool TCopyQualifier::operator()(boost::shared_ptr<ICIMQualifier> qualifier) {
   const TCIMContext none;
   const boost::shared_ptr<ICIMQualifierDecl> declaration = Lock(fDestination)->GetQualifierDecl(qualifier->GetName(none), none);
+  if (!declaration) throw TZEPException(kZEPStatusNotFound);
   fTarget->AddQualifier(declaration, qualifier->GetValue(none), qualifier->GetFlavor(none), none);
   return true;
 }
@@ -182,7 +183,9 @@ bool TCopyInstanceProperty::operator()(boost::shared_ptr<ICIMProperty> property)
   const TCIMContext none;
   const TCIMValue value = property->GetValue(none);
   if (value.IsNull()) return true;
-  fTarget->GetProperty(property->GetName(none), none)->SetValue(TCIMCopy::CopyValue(value, Lock(fDestination)), none);
+  const boost::shared_ptr<ICIMProperty> copy = fTarget->GetProperty(property->GetName(none), none);
+  if (!copy) throw TZEPException(kZEPStatusNotFound);
+  copy->SetValue(TCIMCopy::CopyValue(value, Lock(fDestination)), none);
   return true;
 }
 

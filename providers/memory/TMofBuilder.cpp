@@ -9,6 +9,7 @@
 #include "MofRefusal.h"
 #include "MofValues.h"
 #include "TMofInstances.h"
+#include "TZEPException.h"
 
 namespace NQRVZEP20 {
 
@@ -106,8 +107,11 @@ TCIMValue TMofBuilder::ValueOf(TMofQualifier const& qualifier, TDeclaredQualifie
 TMofBuilder::TDeclaredQualifier const& TMofBuilder::Declared(TMofPlace const& name) {
   const auto found = fDeclared.find(name.fText);
   if (found != fDeclared.end()) return found->second;
-  const auto decl = AtPlace(name, kZEPStatusNotFound, "is no qualifier that is declared",
-                            [&] { return fNamespace->GetQualifierDecl(NameAt(name), kNone); });
+  const auto decl = AtPlace(name, kZEPStatusNotFound, "is no qualifier that is declared", [&] {
+    const boost::shared_ptr<ICIMQualifierDecl> named = fNamespace->GetQualifierDecl(NameAt(name), kNone);
+    if (!named) throw TZEPException(kZEPStatusNotFound);
+    return named;
+  });
   const TDeclaredQualifier declared{decl, decl->GetType(kNone), decl->GetDefaultValue(kNone), decl->GetFlavor(kNone)};
   return fDeclared.emplace(name.fText, declared).first->second;
 }

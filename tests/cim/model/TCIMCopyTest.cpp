@@ -4,8 +4,6 @@
 #include "providers/memory/TMemoryClass.h"
 #include "tests/providers/memory/Collect.h"
 
-#include <boost/thread/recursive_mutex.hpp>
-
 #include <atomic>
 #include <chrono>
 #include <stdexcept>
@@ -205,6 +203,22 @@ TEST_F(TCIMCopyTest, ASuperclassThatIsMissingEndsTheCopyOfAClass) {
   EXPECT_THAT(ClassNames(*copy_), IsEmpty());
 }
 
+TEST_F(TCIMCopyTest, AnEmptyAnswerForAClassCountsAsNotFound) {
+  source_->DefineClass("X_A").Key("Id", "uint32");
+  source_->DefineClass("X_B", "X_A");
+  const auto instance = source_->AddInstance("X_A", {{"Id", 1}});
+  TCIMValue nullReference = NullOf("reference");
+  nullReference.SetReferencedClass(source_->GetClass("X_A", kNone));
+  trace_.fAnswersUnknownClassByEmpty = true;
+  const auto destination = Traced(copy_, "dst");
+  EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_B", kNone), destination), kZEPStatusNotFound);
+  EXPECT_STATUS(TCIMCopy::CopyInstance(instance, destination), kZEPStatusNotFound);
+  EXPECT_STATUS(TCIMCopy::CopyValue(nullReference, destination), kZEPStatusNotFound);
+  EXPECT_STATUS(TCIMCopy::CopyValue(instance->GetReference(), destination), kZEPStatusNotFound);
+  EXPECT_THAT(trace_.fCalls, ElementsAre("GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A"));
+  EXPECT_THAT(ClassNames(*copy_), IsEmpty());
+}
+
 TEST_F(TCIMCopyTest, ARootClassLooksUpNoSuperclass) {
   source_->DefineClass("X_A");
   TCIMCopy::CopyClass(source_->GetClass("X_A", kNone), Traced(copy_, "dst"));
@@ -222,6 +236,23 @@ TEST_F(TCIMCopyTest, AQualifierThatTheDestinationDoesNotDeclareEndsTheCopyOfACla
   EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_A", kNone), copy_), kZEPStatusNotFound);
   EXPECT_THAT(ClassNames(*copy_), ElementsAre("X_A"));
   EXPECT_THAT(Names(*copy_->GetClass("X_A", kNone), &ICIMClass::EnumeratePropertyDecls), IsEmpty());
+}
+
+TEST_F(TCIMCopyTest, AnUndeclaredQualifierIsNotAskedFor) {
+  source_->DefineClass("X_A").Description("a");
+  EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_A", kNone), Traced(copy_, "dst")), kZEPStatusNotFound);
+  EXPECT_THAT(trace_.fCalls, ElementsAre("CreateClass dst:X_A", "GetQualifierDecl dst:Description"));
+}
+
+TEST_F(TCIMCopyTest, AnUndeclaredQualifierOfAPropertyLeavesTheDeclarationWithoutItAndOneLine) {
+  source_->DefineClass("X_A").Property("Name", "string").Description("n").Property("Size", "uint64");
+  OnNewThread([&] {
+    const TLogCapture log;
+    TCIMCopy::CopyClass(source_->GetClass("X_A", kNone), copy_);
+    EXPECT_THAT(log.Entries(), ElementsAre(kLine));
+  });
+  EXPECT_THAT(Names(*copy_->GetClass("X_A", kNone), &ICIMClass::EnumeratePropertyDecls), ElementsAre("Name", "Size"));
+  EXPECT_FALSE(Decl(*copy_, "X_A", "Name")->GetQualifier("Description", kNone));
 }
 
 TEST_F(TCIMCopyTest, ACopiedQualifierHasItsValueAndItsOwnFlavor) {
@@ -401,6 +432,71 @@ TEST_F(TCIMCopyTest, StepsThatNeedNoNamespaceAreDoneWithoutOne) {
   EXPECT_STATUS(cls->EnumerateQualifiers(TCopyQualifier(gone, target), kNone), kZEPStatusFail);
 }
 
+TEST_F(TCIMCopyTest, EachStepCalledByItselfReturnsTrueAndNeedsTheNamespaceForQualifiersOnly) {
+  const auto cls = source_->DefineClass("X_A")
+                       .Description("a")
+                       .Static("Count", "uint16", 1)
+                       .Property("Name", "string")
+                       .Method("Reset", "uint32")
+                       .Class();
+  const auto method = All(*cls, &ICIMClass::EnumerateMethodDecls).front();
+  const auto parameter = method->AddParameterDecl("Force", TType::kCIMTypeBoolean, 0, "", kNone);
+  const auto qualifier = cls->GetQualifier("Description", kNone);
+  const auto count = All(*cls, &ICIMClass::EnumerateStaticProperties).front();
+  const auto name = source_->AddInstance("X_A", {{"Name", "a"}})->GetProperty("Name", kNone);
+
+  for (bool isExpired : {false, true}) {
+    SCOPED_TRACE(isExpired);
+    const auto copy = NewNamespace();
+    const auto target = copy->DefineClass("X_A").Property("Count", "uint16").Property("Name", "string").Class();
+    boost::shared_ptr<ICIMNamespace> other = NewNamespace();
+    const boost::weak_ptr<ICIMNamespace> destination = isExpired ? other : copy;
+    other.reset();
+    ASSERT_EQ(destination.expired(), isExpired);
+
+    EXPECT_TRUE(::TCopyStaticProperty(destination, target)(count));
+    EXPECT_EQ(All(*target, &ICIMClass::EnumerateStaticProperties).front()->GetValue(kNone).ToString(), "1");
+    EXPECT_TRUE(::TCopyMethodDecl(destination, target)(method));
+    const auto copiedMethod = All(*target, &ICIMClass::EnumerateMethodDecls).front();
+    EXPECT_THAT(Names(*copiedMethod, &ICIMMethodDecl::EnumerateParameterDecls), ElementsAre("Force"));
+    const auto plain = target->AddMethodDecl("Plain", TType::kCIMTypeUint32, kNone);
+    EXPECT_TRUE(::TCopyParameterDecl(destination, plain)(parameter));
+    EXPECT_THAT(Names(*plain, &ICIMMethodDecl::EnumerateParameterDecls), ElementsAre("Force"));
+    const auto instance = target->CreateInstance(kNone);
+    EXPECT_TRUE(::TCopyInstanceProperty(destination, instance)(name));
+    EXPECT_EQ(instance->GetProperty("Name", kNone)->GetValue(kNone).ToString(), "a");
+
+    ::TCopyQualifier copyQualifier(destination, target);
+    if (isExpired) {
+      EXPECT_STATUS(copyQualifier(qualifier), kZEPStatusFail);  // a failed assertion
+      EXPECT_FALSE(target->GetQualifier("Description", kNone));
+    } else {
+      EXPECT_TRUE(copyQualifier(qualifier));
+      EXPECT_EQ(target->GetQualifier("Description", kNone)->GetValue(kNone).ToString(), "a");
+    }
+  }
+}
+
+TEST_F(TCIMCopyTest, TheStepsForDeclarationsClassesAndKeysReturnTrue) {
+  source_->DefineClass("X_A").Key("Id", "uint32");
+  const auto cls = source_->GetClass("X_A", kNone);
+  const auto bare = boost::make_shared<TMemoryNamespace>("root/bare");
+  const auto key = source_->GetQualifierDecl("Key", kNone);
+  EXPECT_TRUE(::TCopyQualifierDecls{bare}(key));
+  EXPECT_TRUE((::TCopyClass{bare, true, false}(cls)));  // of the other pass
+  EXPECT_THAT(ClassNames(*bare), IsEmpty());
+  EXPECT_TRUE((::TCopyClass{bare, false, false}(cls)));
+  EXPECT_THAT(ClassNames(*bare), ElementsAre("X_A"));
+  copy_->CreateQualifierDecl("Key", TCIMValue(false), ICIMQualifierDecl::kScopeAny, 0, kNone);
+  EXPECT_TRUE((::TCopyClassTree{copy_, false, false}(cls)));
+  EXPECT_THAT(ClassNames(*copy_), ElementsAre("X_A"));
+
+  TCIMReference path(copy_, kNone);
+  path.SetClass(copy_->GetClass("X_A", kNone));
+  EXPECT_TRUE((::TCopyReferenceKeys{copy_, path}(std::make_pair(std::string("Id"), TCIMValue(7u)))));
+  EXPECT_EQ(path.GetPath(), "X_A.Id=\"7\"");
+}
+
 // ---- Instances ----
 
 class ProductCopyTest : public TCIMCopyTest {
@@ -472,6 +568,10 @@ TEST_F(ProductCopyTest, TheProductClassMayBeAnAssociation) {
   source->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
   TCIMCopy::CopyClasses(source, copy_, false);
   EXPECT_THAT(CopiedProducts(), ElementsAre("QRVSG_ZEPProduct.Name=\"a\""));
+
+  copy_ = NewNamespace();
+  TCIMCopy::CopyClasses(source, copy_, true);
+  EXPECT_THAT(CopiedProducts(), IsEmpty());
 }
 
 TEST_F(ProductCopyTest, AnInstanceThatIsRefusedEndsTheCopy) {
@@ -500,10 +600,10 @@ TEST_F(ProductCopyTest, AnInstanceOfAClassThatTheDestinationLacksIsRefused) {
   EXPECT_STATUS(TCIMCopy::CopyInstance(instance, copy_), kZEPStatusNotFound);
 }
 
-TEST_F(ProductCopyTest, APropertyThatTheDestinationLacksIsAFailedAssertion) {
+TEST_F(ProductCopyTest, APropertyThatTheDestinationLacksIsNotFound) {
   const auto instance = source_->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}, {"Version", "1"}});
   copy_->DefineClass("QRVSG_ZEPProduct").Key("Name", "string");
-  EXPECT_STATUS(TCIMCopy::CopyInstance(instance, copy_), kZEPStatusFail);
+  EXPECT_STATUS(TCIMCopy::CopyInstance(instance, copy_), kZEPStatusNotFound);
   EXPECT_THAT(CopiedProducts(), IsEmpty());
 }
 
@@ -643,6 +743,35 @@ TEST(CopyThreadsTest, AnotherThreadWaitsButTheSameOneDoesNot) {
   other.join();
   EXPECT_TRUE(isDone);
   EXPECT_EQ(All(*copy->GetClass("X_A", kNone), &ICIMClass::EnumerateInstances).size(), 2u);
+}
+
+bool CanAnotherThreadLock() {
+  bool isLocked = false;
+  std::thread([&] { isLocked = boost::recursive_mutex::scoped_try_lock(copyInstMutex).owns_lock(); }).join();
+  return isLocked;
+}
+
+TEST(CopyThreadsTest, TheMutexIsHeldToTheCommitAndFreeAfterwards) {
+  for (bool fails : {false, true}) {
+    SCOPED_TRACE(fails);
+    TTrace trace;
+    const auto source = NewNamespace(), copy = NewNamespace();
+    source->DefineClass("X_A").Key("Id", "uint32");
+    copy->DefineClass("X_A").Key("Id", "uint32");
+    const auto instance = source->AddInstance("X_A", {{"Id", 1}});
+    bool isFree = true;
+    trace.fOnCall["CommitInstance dst:X_A"] = [&] {
+      isFree = CanAnotherThreadLock();
+      if (fails) throw TZEPException(kZEPStatusFail);
+    };
+    auto const copyInstance = [&] { TCIMCopy::CopyInstance(instance, boost::make_shared<TTracedNamespace>(trace, copy, "dst")); };
+    if (fails)
+      EXPECT_STATUS(copyInstance(), kZEPStatusFail);
+    else
+      copyInstance();
+    EXPECT_FALSE(isFree);
+    EXPECT_TRUE(CanAnotherThreadLock());
+  }
 }
 
 TEST(CopyThreadsTest, CopyingClassesTakesNoLock) {

@@ -11,6 +11,7 @@
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
 #include "ICIMQualifier.h"
+#include "TZEPException.h"
 
 #include <boost/enable_shared_from_this.hpp>
 #include <boost/make_shared.hpp>
@@ -25,7 +26,8 @@ namespace NQRVZEP20 {
 struct TTrace {
   std::vector<std::string> fCalls;
   std::map<std::string, std::function<void()>> fOnCall;  // what happens before the call is passed on
-  std::size_t fContextEntries = 0;                       // that were handed over in all calls
+  bool fAnswersUnknownClassByEmpty = false;
+  std::size_t fContextEntries = 0;  // that were handed over in all calls
 
   void Record(std::string const& call, TCIMContext const& context) {
     fCalls.push_back(call);
@@ -53,7 +55,7 @@ public:
   }
   boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                 unsigned int flavor, TCIMContext const& context) override {
-    fTrace.Record("AddQualifier " + fPath + " " + declaration->GetName(context), context);
+    fTrace.Record("AddQualifier " + fPath + " " + (declaration ? declaration->GetName(context) : "of no declaration"), context);
     return fInner->AddQualifier(declaration, value, flavor, context);
   }
 
@@ -249,7 +251,12 @@ public:
   }
   boost::shared_ptr<ICIMClass> GetClass(std::string const& name, TCIMContext const& context) const override {
     fTrace.Record("GetClass " + fLabel + name, context);
-    return Wrap(fInner->GetClass(name, context));
+    try {
+      return Wrap(fInner->GetClass(name, context));
+    } catch (TZEPException const&) {
+      if (fTrace.fAnswersUnknownClassByEmpty) return nullptr;
+      throw;
+    }
   }
   void EnumerateClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)> callback, TCIMContext const& context) const override {
     fTrace.Record("EnumerateClasses " + fLabel, context);
