@@ -108,8 +108,7 @@ TRun AddReportArguments(CLI::App& command) {
   command.allow_extras();  // HasExtras refuses them
   command.footer(
       "Exit status: 0 when everything could be told, 2 when the report says what is missing, 1 when nothing\n"
-      "could be told or the medium could not be written and unmounted, 64 for wrong usage; when it could not be
-      "
+      "could be told or the medium could not be written and unmounted, 64 for wrong usage; when it could not be\n"
       "sent, as that of zep send.");
   return [&command, arguments] { return HasExtras(command) ? kExitUsage : Report(*arguments); };
 }
