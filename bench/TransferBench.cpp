@@ -37,6 +37,7 @@ public:
     std::string const chunk(1 << 20, 'x');
     for (std::size_t i = 0; i < kSize / chunk.size(); ++i) file << chunk;
     file.close();
+    CheckSize(Local());
     fs::create_directory(fDirectory + "/tree");
     fs::copy_file(Local(), fDirectory + "/tree/big");
   }
@@ -47,7 +48,12 @@ public:
   TBed(TBed const&) = delete;
   TBed& operator=(TBed const&) = delete;
 
+  static void CheckSize(std::string const& file) {
+    if (fs::file_size(file) != kSize) throw std::runtime_error(file + " has not all of its bytes");
+  }
+
   std::string Local() const { return fDirectory + "/local"; }
+  std::string Up() const { return fDirectory + "/tree/up"; }
   std::string Down() const { return fDirectory + "/down"; }
   std::string Url(char const* script) {
     if (fScript != script) Start(script);
@@ -122,7 +128,9 @@ void Transfer(benchmark::State& state, char const* script, TTransfer transfer) {
   for (auto _ : state) {
     transfer(url);
     state.PauseTiming();
-    fs::remove(Bed().Down());
+    std::string const file = fs::exists(Bed().Up()) ? Bed().Up() : Bed().Down();
+    Bed().CheckSize(file);
+    fs::remove(file);
     state.ResumeTiming();
   }
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * kSize));

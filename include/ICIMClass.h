@@ -36,8 +36,9 @@ public:
 
   // Between these two a plug-in knows that the class is still being described: GetPropertyDecl then answers a name that
   // is not declared yet with an empty pointer instead of throwing. Not nested; ending what was not begun does nothing.
-  virtual void BeginDeclarations(TCIMContext const& context) = 0;
-  virtual void EndDeclarations(TCIMContext const& context) = 0;
+  // Both have a body, which does nothing.
+  virtual void BeginDeclarations(TCIMContext const& context);
+  virtual void EndDeclarations(TCIMContext const& context);
 
   // Declares a property. The default value, NULL for none, gives its type, array bound and referenced class. Throws
   // kZEPStatusAlreadyExists when this class itself declares the name, kZEPStatusTypeMismatch for a default of tag 0, and

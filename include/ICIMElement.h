@@ -22,8 +22,11 @@ namespace NQRVZEP20 {
 //   TCIMContext() unless there is something to carry. A plug-in that knows nothing of an entry ignores it.
 // - An enumeration calls back once per element and stops at the first call that returns false. TAddToVectorCallback
 //   collects everything. The callback may look elements up, but must not add to what is being enumerated.
-// - Failure is a thrown TZEPException. A class, property declaration or qualifier declaration that is not there is
-//   kZEPStatusNotFound; anything else that is not there comes back as an empty pointer.
+// - Failure is a thrown TZEPException. A class or property declaration that is not there is kZEPStatusNotFound; anything
+//   else that is not there (a qualifier declaration, a qualifier, a property, an instance) comes back as an empty pointer,
+//   which the caller tests before use.
+// - An operation that the library does not need has a body, so that a plug-in need not write one. It throws
+//   kZEPStatusNotImplemented, unless its comment says otherwise. The tool zep and the memory namespace use these, too.
 // - Names are compared without regard to case, as CIM names are, and keep the spelling they were made with. What is
 //   created or declared under a name that is no CIM name throws kZEPStatusInvalidCIMName.
 // - Nothing is promised about threads: one namespace is used from one thread at a time.

@@ -24,8 +24,8 @@ public:
   virtual void EnumerateProperties(boost::function<bool(boost::shared_ptr<ICIMProperty>)> callback,
                                    TCIMContext const& context) const = 0;
 
-  // The object path: the class and the values of its key properties. A key whose value is NULL is left out.
-  virtual TCIMReference GetPath(TCIMContext const& context) const = 0;
+  // The object path: the class and the values of its key properties. A key whose value is NULL is left out. Has a body.
+  virtual TCIMReference GetPath(TCIMContext const& context) const;
 };
 
 }  // namespace NQRVZEP20

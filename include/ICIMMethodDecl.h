@@ -25,8 +25,8 @@ public:
   virtual void EnumerateParameterDecls(boost::function<bool(boost::shared_ptr<ICIMParameterDecl>)> callback,
                                        TCIMContext const& context) const = 0;
 
-  // The class that declares it.
-  virtual boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const = 0;
+  // The class that declares it. Has a body, which answers with an empty pointer.
+  virtual boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const;
 };
 
 }  // namespace NQRVZEP20

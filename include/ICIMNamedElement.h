@@ -22,10 +22,10 @@ public:
   virtual void EnumerateQualifiers(boost::function<bool(boost::shared_ptr<ICIMQualifier>)> callback,
                                    TCIMContext const& context) const = 0;
 
-  // Writes a qualifier on this element. `declaration` is one of this element's own namespace (kZEPStatusNotFound); the
-  // value must be of the declared type (kZEPStatusTypeMismatch). Throws kZEPStatusAlreadyExists when the element has this
-  // qualifier, and kZEPStatusInvalidOpSequence for Key on a property of a class that has made instances. Whether the
-  // qualifier may stand on this kind of element is not checked.
+  // Writes a qualifier on this element. `declaration` is one of this element's own namespace (kZEPStatusNotFound, as for an
+  // empty one); the value must be of the declared type (kZEPStatusTypeMismatch). Throws kZEPStatusAlreadyExists when the element
+  // has it, kZEPStatusInvalidOpSequence for Key on a property of a class that has made instances. Whether the qualifier may
+  // stand on this kind of element is not checked.
   virtual boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                         unsigned int flavor, TCIMContext const& context) = 0;
 };

@@ -14,7 +14,7 @@ class ZEP_EXPORT ICIMNamespace {
 public:
   virtual ~ICIMNamespace();
 
-  virtual std::string GetName(TCIMContext const& context) const = 0;  // such as "root/cimv2"
+  virtual std::string GetName(TCIMContext const& context) const;  // such as "root/cimv2"; has a body
 
   // Creates a class under `superClass`, which is of this namespace (kZEPStatusInvalidClass) or empty for a root class.
   // Throws kZEPStatusAlreadyExists when there is a class of that name.
@@ -33,11 +33,13 @@ public:
 
   // The default value, NULL for none, gives type and array bound. `scope` and `flavor` are sets of
   // ICIMQualifierDecl::EScope and EFlavor. Throws kZEPStatusAlreadyExists when the name is declared, and
-  // kZEPStatusTypeMismatch for a type that no qualifier can have (tag 0, references).
+  // kZEPStatusTypeMismatch for a type that no qualifier can have (tag 0, references). Has a body: only the destination of
+  // a namespace copy needs it.
   virtual boost::shared_ptr<ICIMQualifierDecl> CreateQualifierDecl(std::string const& name, TCIMValue const& defaultValue,
                                                                    unsigned int scope, unsigned int flavor,
-                                                                   TCIMContext const& context) = 0;
+                                                                   TCIMContext const& context);
 
+  // Empty when the name is not declared.
   virtual boost::shared_ptr<ICIMQualifierDecl> GetQualifierDecl(std::string const& name, TCIMContext const& context) const = 0;
 
   // In the order in which they were created.

@@ -17,8 +17,8 @@ public:
   // The name of the class that a reference, or an array of references, refers to; empty for other types.
   virtual std::string GetReferencedClassName(TCIMContext const& context) const = 0;
 
-  // The method that it belongs to.
-  virtual boost::weak_ptr<ICIMMethodDecl> GetMethod(TCIMContext const& context) const = 0;
+  // The method that it belongs to. Has a body, which answers with an empty pointer.
+  virtual boost::weak_ptr<ICIMMethodDecl> GetMethod(TCIMContext const& context) const;
 };
 
 }  // namespace NQRVZEP20

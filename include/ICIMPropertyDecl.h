@@ -13,11 +13,12 @@ public:
   virtual TCIMValue::TCIMType GetType(TCIMContext const& context) const = 0;
   virtual TCIMValue GetDefaultValue(TCIMContext const& context) const = 0;
 
-  // True when the property identifies instances: it carries the qualifier Key, or overrides a property that does.
-  virtual bool IsKey(TCIMContext const& context) const = 0;
+  // True when the property identifies instances: it carries the qualifier Key, or overrides a property that does. Has a
+  // body.
+  virtual bool IsKey(TCIMContext const& context) const;
 
-  // The class that declares it.
-  virtual boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const = 0;
+  // The class that declares it. Has a body, which answers with an empty pointer.
+  virtual boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const;
 };
 
 }  // namespace NQRVZEP20

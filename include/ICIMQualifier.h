@@ -15,10 +15,10 @@ public:
   virtual std::string GetName(TCIMContext const& context) const = 0;  // spelled as declared
   virtual TCIMValue GetValue(TCIMContext const& context) const = 0;
   virtual unsigned int GetFlavor(TCIMContext const& context) const = 0;  // a set of ICIMQualifierDecl::EFlavor
-  virtual boost::shared_ptr<ICIMQualifierDecl> GetDeclaration(TCIMContext const& context) const = 0;
+  virtual boost::shared_ptr<ICIMQualifierDecl> GetDeclaration(TCIMContext const& context) const;  // has a body
 
-  // The element that it is written on.
-  virtual boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const = 0;
+  // The element that it is written on. Has a body, which answers with an empty pointer.
+  virtual boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const;
 };
 
 }  // namespace NQRVZEP20

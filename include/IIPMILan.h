@@ -17,6 +17,8 @@ ZEP_EXPORT extern std::string gIPMILanPort;
 ZEP_EXPORT extern std::string gIPMILanUser;
 ZEP_EXPORT extern std::string gIPMILanPass;
 
+constexpr int MAXMULTINODE = 16;  // nodes of a server
+
 // The link to the server's management controller: IPMI over the LAN, through the platform library libipmiClient.so, with
 // the controller's USB-LAN brought up by the platform library ./ovdusblan.so.
 //
@@ -25,7 +27,7 @@ ZEP_EXPORT extern std::string gIPMILanPass;
 // time. Opening, closing and bringing up block for the network.
 class ZEP_EXPORT IIPMILan {
 public:
-  static constexpr int MAXMULTINODE = 16;
+  static constexpr int MAXMULTINODE = NQRVZEP20::MAXMULTINODE;
 
   // Makes a new link the one of the process and returns it. An earlier one is not freed: pointers to it stay valid. Kept.
   static IIPMILan* Initialize();
@@ -96,6 +98,7 @@ public:
   // it; behind the length byte the packet's area must hold as many bytes as that says, and at least 7.
   bool ChkResponse(char* packet, int lengthPosition, int mode);
 
+  static IIPMILan* fgipmilanInstance;             // null until the first use
   static std::string m_LANMapping[MAXMULTINODE];  // the USB-LAN address of each node's controller
 
   // ---- For the caller to fill in; the link itself only hands them out and asks the two flags ----
@@ -120,8 +123,6 @@ private:
   bool fIsResponseValid = false;
   std::uint64_t fSequence = 0;
   [[maybe_unused]] IIPMILan* const fReplaced;  // the link before this one, so that what is never freed stays within reach
-
-  static IIPMILan* fgipmilanInstance;
 };
 
 }  // namespace NQRVZEP20

@@ -26,6 +26,7 @@
 #include "TCIMChar16.h"
 #include "TCIMChar16Impl.h"
 #include "TCIMChar16ValueImpl.h"
+#include "TCIMCopy.h"
 #include "TCIMDateTime.h"
 #include "TCIMDateTimeImpl.h"
 #include "TCIMDateTimeValueImpl.h"

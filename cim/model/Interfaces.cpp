@@ -1,4 +1,5 @@
-// The destructors of the interfaces stand here, so that each interface's virtual table is made once, in this library.
+// The destructors of the interfaces stand here, so that each interface's virtual table is made once, in this library; and
+// the bodies of the operations that a plug-in may leave out.
 
 #include "ICIMClass.h"
 #include "ICIMElement.h"
@@ -14,6 +15,8 @@
 #include "INamespaceConsumer.h"
 #include "INamespaceProvider.h"
 #include "INamespaceProviderManager.h"
+#include "TCIMReference.h"
+#include "TZEPException.h"
 
 namespace NQRVZEP20 {
 
@@ -31,5 +34,31 @@ ICIMQualifierDecl::~ICIMQualifierDecl() = default;
 INamespaceConsumer::~INamespaceConsumer() = default;
 INamespaceProvider::~INamespaceProvider() = default;
 INamespaceProviderManager::~INamespaceProviderManager() = default;
+
+// ---- What a plug-in may leave out ----
+
+std::string ICIMNamespace::GetName(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
+
+boost::shared_ptr<ICIMQualifierDecl> ICIMNamespace::CreateQualifierDecl(std::string const&, TCIMValue const&, unsigned int,
+                                                                        unsigned int, TCIMContext const&) {
+  throw TZEPException(kZEPStatusNotImplemented);
+}
+
+void ICIMClass::BeginDeclarations(TCIMContext const&) {}
+void ICIMClass::EndDeclarations(TCIMContext const&) {}
+
+TCIMReference ICIMInstance::GetPath(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
+
+bool ICIMPropertyDecl::IsKey(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
+boost::weak_ptr<ICIMNamedElement> ICIMPropertyDecl::GetOwner(TCIMContext const&) const { return {}; }
+
+boost::weak_ptr<ICIMNamedElement> ICIMMethodDecl::GetOwner(TCIMContext const&) const { return {}; }
+
+boost::weak_ptr<ICIMMethodDecl> ICIMParameterDecl::GetMethod(TCIMContext const&) const { return {}; }
+
+boost::shared_ptr<ICIMQualifierDecl> ICIMQualifier::GetDeclaration(TCIMContext const&) const {
+  throw TZEPException(kZEPStatusNotImplemented);
+}
+boost::weak_ptr<ICIMNamedElement> ICIMQualifier::GetOwner(TCIMContext const&) const { return {}; }
 
 }  // namespace NQRVZEP20

@@ -90,6 +90,7 @@ TMemoryClassBuilder& TMemoryClassBuilder::Qualifier(std::string const& name, TCI
   const TCIMContext none;
   NameRefusal(ClassName(), "[" + name + "]", [&] {
     const boost::shared_ptr<ICIMQualifierDecl> decl = fClass->GetNamespace(none)->GetQualifierDecl(name, none);
+    if (!decl) throw TZEPException(kZEPStatusNotFound);
     fElement->AddQualifier(decl, FittedTo(decl->GetDefaultValue(none), value), decl->GetFlavor(none), none);
   });
   return *this;

@@ -29,6 +29,7 @@ public:
 
   boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                 unsigned int flavor, TCIMContext const& context) override {
+    if (!declaration) throw TZEPException(kZEPStatusNotFound);
     const std::string name = declaration->GetName(context);
     const boost::shared_ptr<ICIMNamespace> ns(fNamespace);
     if (ns->GetQualifierDecl(name, context) != declaration) throw TZEPException(kZEPStatusNotFound);

@@ -61,9 +61,7 @@ boost::shared_ptr<ICIMQualifierDecl> TMemoryNamespace::CreateQualifierDecl(std::
 }
 
 boost::shared_ptr<ICIMQualifierDecl> TMemoryNamespace::GetQualifierDecl(std::string const& name, TCIMContext const&) const {
-  const boost::shared_ptr<ICIMQualifierDecl> decl = fQualifierDecls.Find(name);
-  if (!decl) throw TZEPException(kZEPStatusNotFound);
-  return decl;
+  return fQualifierDecls.Find(name);
 }
 
 void TMemoryNamespace::EnumerateQualifierDecls(boost::function<bool(boost::shared_ptr<ICIMQualifierDecl>)> callback,

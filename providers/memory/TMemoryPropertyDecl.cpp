@@ -30,6 +30,7 @@ boost::weak_ptr<ICIMNamedElement> TMemoryPropertyDecl::GetOwner(TCIMContext cons
 boost::shared_ptr<ICIMQualifier> TMemoryPropertyDecl::AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration,
                                                                    TCIMValue const& value, unsigned int flavor,
                                                                    TCIMContext const& context) {
+  if (!declaration) throw TZEPException(kZEPStatusNotFound);
   const boost::shared_ptr<TMemoryClass> owner(fOwner);
   if (owner->HasMadeInstances() && IsSameName(declaration->GetName(context), kKey))
     throw TZEPException(kZEPStatusInvalidOpSequence);

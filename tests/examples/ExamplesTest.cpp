@@ -134,6 +134,10 @@ TEST(DocumentationTest, WalkThroughShowsTheCodeOfTheExample) {
   EXPECT_EQ(FirstBlockOf("docs/writing-a-provider.md", "cmake"), SourceFile("examples/Clock/CMakeLists.txt"));
 }
 
+TEST(DocumentationTest, PageOnSchemasShowsTheCodeOfTheExample) {
+  ExpectBlocksFrom("docs/schemas.md", "cpp", "examples/Disks/Disks.cpp", 1);
+}
+
 // Clocks run on: every number behind " = " is as good as another.
 std::string WithoutNumbers(std::string const& text) { return std::regex_replace(text, std::regex(" = \\d+"), " = N"); }
 

@@ -34,7 +34,7 @@ TRoom const kRooms[] = {
     {"platform/usblan", {"platform/include"}},
     {"providers/memory", {"include"}},
     {"providers/host", {"include", "providers/memory", "platform/include"}},
-    {"tools/zep", {"include"}},
+    {"tools/zep", {"include", "providers/memory"}},
 };
 
 fs::path const kSource = ZEP_SOURCE_DIR;

@@ -307,6 +307,11 @@ TEST_F(LoadingCurlTest, WithoutOneEachCallTriesEveryNameAgain) {
       "TOSSpecific|CurlTransferFile: Error opening curl library: "
       "libcurl.so.2: cannot open shared object file: No such file or directory\n";
   EXPECT_EQ(Probe().output, failure + failure);
+  std::string const ofProxy =
+      "kZEPStatusLibCurlFailure\n"
+      "TOSSpecific|CheckProxySetting: Error opening curl library: "
+      "libcurl.so.2: cannot open shared object file: No such file or directory\n";
+  EXPECT_EQ(Probe("--proxy").output, ofProxy + ofProxy);
   // One that comes between the two calls is found by the second.
   std::string const late = Root("libcurl.so.4");
   EXPECT_EQ(Probe(kStandIn + " " + late).output, failure + late + "\ndone\n");
@@ -508,18 +513,25 @@ TEST_F(ProxyCheckTest, SetsItsOptionsInOrder) {
     log = LogOf([&] { EXPECT_EQ(TOSSpecific::CheckProxySetting("10.0.0.1", "8080", "u:p", 5), kZEPStatusOK); });
   });
   EXPECT_THAT(record_.calls, ElementsAre("global_init 3", "easy_init", "setopt ERRORBUFFER buffer", "setopt PROXY '10.0.0.1'",
-                                         "setopt PROXYPORT 8080", "setopt URL 'http://www.example.com/'",
+                                         "setopt PROXYPORT 8080", "setopt URL '" ZEP_PROXY_CHECK_PAGE "'",
                                          "setopt WRITEFUNCTION function", "setopt WRITEDATA context", "setopt PROXYUSERPWD 'u:p'",
                                          "perform", "write 6 file 6", "write 7 file 13", "easy_cleanup", "global_cleanup"));
   EXPECT_EQ(ReadFile(dir_.Path("content.html")), "<html></html>");
   EXPECT_THAT(log, IsEmpty());
 }
 
+TEST_F(ProxyCheckTest, ThePageIsAddedToAFileThatIsThere) {
+  WriteFile(dir_.Path("content.html"), "earlier ");
+  record_.chunks = {"page"};
+  WithStandIn(record_, [] { EXPECT_EQ(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), kZEPStatusOK); });
+  EXPECT_EQ(ReadFile(dir_.Path("content.html")), "earlier page");
+}
+
 TEST_F(ProxyCheckTest, ARefusedOptionEndsIt) {
   ExpectRefusals({{10010, "TOSSpecific|CheckProxySetting: Error configuring curl error buffer", "setopt ERRORBUFFER buffer"},
                   {10004, "TOSSpecific|CheckProxySetting: Error setting proxyIp", "setopt PROXY 'p'"},
                   {59, "TOSSpecific|CheckProxySetting: Error setting proxyPort", "setopt PROXYPORT 1"},
-                  {10002, "TOSSpecific|CheckProxySetting: Error setting URL", "setopt URL 'http://www.example.com/'"},
+                  {10002, "TOSSpecific|CheckProxySetting: Error setting URL", "setopt URL '" ZEP_PROXY_CHECK_PAGE "'"},
                   {20011, "TOSSpecific|CurlTransferFile: Error setting curl write function", "setopt WRITEFUNCTION function"},
                   {10001, "TOSSpecific|CurlTransferFile: Error setting curl write function", "setopt WRITEDATA context"},
                   {10006, "TOSSpecific|CheckProxySetting: Error setting userId & passwd", "setopt PROXYUSERPWD 'u:p'"}},

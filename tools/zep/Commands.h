@@ -18,9 +18,11 @@ struct TCommand {
   TRun (*fAddArguments)(CLI::App& command);
 };
 
+TRun AddClassesArguments(CLI::App& command);     // ClassesCommand.cpp
 TRun AddConfigArguments(CLI::App& command);      // ConfigCommand.cpp
 TRun AddGetArguments(CLI::App& command);         // GetCommand.cpp
 TRun AddMediaArguments(CLI::App& command);       // MediaCommand.cpp
+TRun AddMofArguments(CLI::App& command);         // MofCommand.cpp
 TRun AddProxyCheckArguments(CLI::App& command);  // ProxyCheckCommand.cpp
 TRun AddRemoteArguments(CLI::App& command);      // RemoteCommand.cpp
 TRun AddReportArguments(CLI::App& command);      // ReportCommand.cpp

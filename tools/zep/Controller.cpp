@@ -45,8 +45,9 @@ std::string OrUnknown(std::string const& field) { return field.empty() ? "unknow
 
 std::string AskController(std::string const& host, TAccount const& account) {
   auto const start = TClock::now();
-  std::string const type = Field(TOSSpecific::GetRemoteMT(host, account.fUser, account.fPassword));
-  if (type.empty()) return std::string(3, kEnd) + WithoutASession(start) + kEnd;
+  std::string const answer = TOSSpecific::GetRemoteMT(host, account.fUser, account.fPassword);
+  if (answer.empty()) return std::string(3, kEnd) + WithoutASession(start) + kEnd;
+  std::string const type = Field(answer);
   std::string const model = Field(TOSSpecific::GetRemoteMachineModel(host, account.fUser, account.fPassword));
   std::string const serialNumber = Field(TOSSpecific::GetRemoteMSN(host, account.fUser, account.fPassword));
   IIPMILan::GetInstance()->IpmilanCloseConnect();

@@ -23,7 +23,15 @@ struct TArguments {
   TTransferOptions fOptions;
 };
 
-bool IsThere(std::string const& file) { return std::filesystem::exists(std::filesystem::symlink_status(file)); }
+namespace fs = std::filesystem;
+
+// Of a symbolic link what it leads to: that is written, and the link stays.
+std::string WithoutLinks(std::string const& file) {
+  std::error_code nowhere;
+  if (!fs::is_symlink(fs::symlink_status(file, nowhere))) return file;
+  fs::path const target = fs::canonical(file, nowhere);
+  return nowhere ? file : target.string();
+}
 
 bool IsOverwritingWanted(std::string const& file) {
   std::cerr << "zep: " << Printable(file) << " exists; overwrite it? (y/n): " << std::flush;
@@ -32,11 +40,13 @@ bool IsOverwritingWanted(std::string const& file) {
   return answer == "y" || answer == "Y";
 }
 
-// Why the file may not be written; empty when it may. Asks only where somebody can answer.
-std::string WhyNotWritten(TArguments const& arguments) {
-  std::string const& file = arguments.fFile;
-  if (std::filesystem::is_directory(file)) return Printable(file) + " is a directory";
-  if (arguments.fForce || !IsThere(file)) return "";
+// Why the file may not be written; empty when it may. Asks only where somebody can answer. A device and the like is never
+// replaced, nor a link that leads nowhere.
+std::string WhyNotWritten(TArguments const& arguments, std::string const& file, fs::file_status const& status) {
+  if (!fs::exists(status)) return "";
+  if (fs::is_directory(status)) return Printable(file) + " is a directory";
+  if (!fs::is_regular_file(status)) return Printable(file) + " is no regular file";
+  if (arguments.fForce) return "";
   if (!arguments.fNoClobber && ::isatty(STDIN_FILENO))
     return IsOverwritingWanted(file) ? "" : Printable(file) + " is left as it is";
   return Printable(file) + " exists" + (arguments.fNoClobber ? "" : "; --force overwrites it");
@@ -45,13 +55,16 @@ std::string WhyNotWritten(TArguments const& arguments) {
 int Get(TArguments const& arguments) {
   TTarget const source = TargetOf(arguments.fUrl, false);
   if (source.fIsHost) throw TWrongUsage("a URL is needed, ftp:// or sftp://");
-  bool const isThere = IsThere(arguments.fFile);
-  std::string const why = WhyNotWritten(arguments);
+  std::string const file = WithoutLinks(arguments.fFile);
+  std::error_code unknown;
+  fs::file_status const status = fs::symlink_status(file, unknown);
+  std::string const why = WhyNotWritten(arguments, file, status);
   if (!why.empty()) {
     std::cerr << "zep: " << why << "\n";
     return kExitNotWritten;
   }
-  TTransferred const fetched = GetFile(source.fRemote, arguments.fFile, isThere || arguments.fForce, arguments.fOptions);
+  bool const overwrites = fs::exists(status) || arguments.fForce;
+  TTransferred const fetched = GetFile(source.fRemote, file, overwrites, arguments.fOptions);
   return TellOf(fetched, "zep get", arguments.fAsJson, arguments.fOptions);
 }
 
@@ -67,8 +80,11 @@ TRun AddGetArguments(CLI::App& command) {
   AddTransferOptions(command, arguments->fOptions);
   command.allow_extras();  // HasExtras refuses them
   command.footer(
-      "A file that is there is overwritten after a question, which is asked on a terminal only. Until all has arrived the file\n"
-      "bears \".part\" behind its name; what arrived of a broken transfer keeps that name.\n" +
+      "A file that is there is overwritten after a question, which is asked on a terminal only; of a symbolic link the file "
+      "that\n"
+      "it leads to. Until all has arrived the file bears \".part\" behind its name; what arrived of a broken transfer keeps "
+      "that\n"
+      "name.\n" +
       TransferHelp());
   return [&command, arguments] { return HasExtras(command) ? kExitUsage : Get(*arguments); };
 }

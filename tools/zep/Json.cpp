@@ -5,6 +5,7 @@
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
 #include "Sample.h"
+#include "ValueWords.h"
 
 #include <cmath>
 
@@ -22,10 +23,24 @@ TJson ArrayAsJson(std::vector<TCIMValue> const& elements) {
   return array;
 }
 
+// The word for the value, or those for the elements of an array; null where there is none.
+TJson WordsAsJson(TValueWords const& words, TCIMValue const& value) {
+  if (words.Entries().empty() || value.IsNull()) return nullptr;
+  if (!value.IsArray()) {
+    std::string const word = words.WordFor(value);
+    return word.empty() ? TJson(nullptr) : TJson(word);
+  }
+  TJson array = TJson::array();
+  for (TCIMValue const& element : static_cast<std::vector<TCIMValue>&>(value)) array.push_back(WordsAsJson(words, element));
+  return array;
+}
+
 TJson PropertyAsJson(TNamespaceView const& view, ICIMInstance const& instance, ICIMProperty const& property) {
   TCIMValue const value = property.GetValue(TCIMContext());
   TJson json = {{"type", NameOf(value.GetType())}, {"value", ValueAsJson(value)}};
   auto const declaration = property.GetDeclaration(TCIMContext());
+  TJson const words = WordsAsJson(TValueWords(*declaration), value);
+  if (!words.is_null()) json["words"] = words;
   if (declaration->IsKey(TCIMContext())) json["key"] = true;
   json["source"] = view.SourceOf(*declaration);
   if (value.IsNull()) {

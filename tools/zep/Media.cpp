@@ -4,8 +4,14 @@
 #include "Json.h"
 #include "TOSSpecific.h"
 
+#include <fcntl.h>
+#include <linux/cdrom.h>
+#include <sys/ioctl.h>
 #include <sys/sysmacros.h>
+#include <unistd.h>
 
+#include <algorithm>
+#include <cerrno>
 #include <fstream>
 #include <iterator>
 #include <sstream>
@@ -47,20 +53,46 @@ std::string DescriptionOf(TJson const& drive) {
   return vendor + (model.empty() ? "" : " ") + model;
 }
 
-TMedium MediumFrom(TJson const& node, std::string const& description) {
-  TMedium medium{TextOf(node, "name"), description, TextOf(node, "label"), TextOf(node, "fstype"), 0, FlagOf(node, "ro"), {}};
-  if (auto const size = node.find("size"); size != node.end() && size->is_number_unsigned()) medium.fSize = *size;
+bool IsPartition(TJson const& node) { return TextOf(node, "type") == "part"; }
+
+// Also those of an opened encrypted or logical volume, which is a child of what it is on.
+void AddMountPoints(TJson const& node, std::vector<std::string>& mountPoints) {
   for (TJson const& mountPoint : node.value("mountpoints", TJson::array()))
-    if (mountPoint.is_string()) medium.fMountPoints.push_back(mountPoint);
+    if (mountPoint.is_string()) mountPoints.push_back(mountPoint);
+  for (TJson const& child : node.value("children", TJson::array()))
+    if (!IsPartition(child)) AddMountPoints(child, mountPoints);
+}
+
+TMedium MediumFrom(TJson const& node, std::string const& description) {
+  TMedium medium{};
+  medium.fDevice = TextOf(node, "name");
+  medium.fDescription = description;
+  medium.fLabel = TextOf(node, "label");
+  medium.fFileSystem = TextOf(node, "fstype");
+  if (auto const size = node.find("size"); size != node.end() && size->is_number_unsigned()) medium.fSize = *size;
+  medium.fIsReadOnly = FlagOf(node, "ro");
+  AddMountPoints(node, medium.fMountPoints);
+  medium.fIsOptical = TextOf(node, "type") == "rom";
   return medium;
 }
 
 // The drive itself where it has no partitions, or a file system beside them, and every partition.
 void AddMediaOf(TJson const& drive, std::vector<TMedium>& media) {
-  TJson const partitions = drive.value("children", TJson::array());
+  TJson const children = drive.value("children", TJson::array());
   TMedium const whole = MediumFrom(drive, DescriptionOf(drive));
-  if (partitions.empty() || !whole.fFileSystem.empty()) media.push_back(whole);
-  for (TJson const& partition : partitions) media.push_back(MediumFrom(partition, whole.fDescription));
+  if (std::none_of(children.begin(), children.end(), IsPartition) || !whole.fFileSystem.empty()) media.push_back(whole);
+  for (TJson const& child : children)
+    if (IsPartition(child)) media.push_back(MediumFrom(child, whole.fDescription));
+}
+
+// Whether an optical drive is empty, which is asked for in a way that leaves its tray where it is.
+bool IsEmptyDrive(TMedium const& medium) {
+  if (!medium.fIsOptical) return false;
+  int const fd = ::open(medium.fDevice.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
+  if (fd < 0) return errno == ENOMEDIUM;
+  int const status = ::ioctl(fd, CDROM_DRIVE_STATUS, CDSL_CURRENT);
+  ::close(fd);
+  return status == CDS_NO_DISC || status == CDS_TRAY_OPEN;
 }
 
 bool HasUdev() { return TOSSpecific::DirExists("/run/udev/data"); }
@@ -87,6 +119,11 @@ bool HasOption(std::string const& options, std::string const& option) {
 bool IsPlainPath(std::string const& name) {
   return !name.empty() && name[0] == '/' && name.find_first_not_of(kPlainCharacters) == name.npos &&
          (name + "/").find("/./") == name.npos && (name + "/").find("/../") == name.npos;
+}
+
+std::string WithoutTrailingSlashes(std::string name) {
+  while (name.size() > 1 && name.back() == '/') name.pop_back();
+  return name;
 }
 
 void CheckDevice(std::string const& device) {
@@ -121,6 +158,7 @@ std::vector<TMedium> FindMedia() {
   if (TOSSpecific::SpawnProcess("lsblk", arguments, output, kTimeoutSeconds) != 0)
     throw std::runtime_error(output.empty() ? "lsblk cannot be run" : "lsblk failed: " + output.substr(0, output.find('\n')));
   std::vector<TMedium> media = MediaIn(output);
+  media.erase(std::remove_if(media.begin(), media.end(), IsEmptyDrive), media.end());
 
   // lsblk knows of labels what udev has told; where there is no udev, root reads them.
   if (!HasUdev() && TOSSpecific::IsAdmin())
@@ -131,8 +169,8 @@ std::vector<TMedium> FindMedia() {
 
 bool AreLabelsReadable() { return TOSSpecific::IsAdmin() || HasUdev(); }
 
-std::optional<TMount> MountIn(std::string const& mountInfo, std::string const& directory) {
-  std::optional<TMount> mount;
+std::vector<TMount> MountsIn(std::string const& mountInfo) {
+  std::vector<TMount> mounts;
   std::istringstream lines(mountInfo);
   for (std::string line; std::getline(lines, line);) {
     // "36 35 8:17 / /mnt/key rw,noatime shared:1 - vfat /dev/sdb1 rw"
@@ -142,11 +180,20 @@ std::optional<TMount> MountIn(std::string const& mountInfo, std::string const& d
     char colon = 0;
     fields >> id >> parent >> major >> colon >> minor >> root >> mountPoint >> options;
     while (fields >> optional && optional != "-") continue;
-    if (!(fields >> type >> source >> superOptions) || WithoutEscapes(mountPoint) != directory) continue;
-    mount = TMount{WithoutEscapes(source), ::gnu_dev_makedev(major, minor),
-                   HasOption(options, "ro") || HasOption(superOptions, "ro")};
+    if (!(fields >> type >> source >> superOptions)) continue;
+    mounts.push_back({WithoutEscapes(mountPoint), WithoutEscapes(source), ::gnu_dev_makedev(major, minor),
+                      HasOption(options, "ro") || HasOption(superOptions, "ro")});
   }
-  return mount;
+  return mounts;
+}
+
+std::vector<TMount> Mounts() { return MountsIn(TOSSpecific::CaptureFile("/proc/self/mountinfo")); }
+
+std::optional<TMount> MountIn(std::string const& mountInfo, std::string const& directory) {
+  std::optional<TMount> topmost;
+  for (TMount const& mount : MountsIn(mountInfo))
+    if (mount.fMountPoint == directory) topmost = mount;
+  return topmost;
 }
 
 std::optional<TMount> MountAt(std::string const& directory) {

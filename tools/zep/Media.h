@@ -13,6 +13,9 @@ namespace NQRVZEP20::zep {
 // "/", "-", "_" and ".", an absolute path, and none of its parts "." or "..".
 bool IsPlainPath(std::string const& name);
 
+// "/mnt/key" for "/mnt/key/"; "/" stays.
+std::string WithoutTrailingSlashes(std::string name);
+
 // Throws TWrongUsage for a name that is no plain path below /dev, std::runtime_error for a device that is not there.
 void CheckDevice(std::string const& device);
 
@@ -25,7 +28,8 @@ struct TMedium {
   std::string fLabel, fFileSystem;
   std::uint64_t fSize;  // in bytes
   bool fIsReadOnly;
-  std::vector<std::string> fMountPoints;  // none when it is not mounted
+  std::vector<std::string> fMountPoints;  // also those of the encrypted and logical volumes on it; none when it is not mounted
+  bool fIsOptical;
 };
 
 // The media that the output of "lsblk --json" shows, of disks and drives that are removable or on the USB. Throws
@@ -42,12 +46,17 @@ std::vector<TMedium> FindMedia();
 bool AreLabelsReadable();
 
 struct TMount {
+  std::string fMountPoint;
   std::string fSource;  // "/dev/sdb1"
   std::uint64_t fDevice;
   bool fIsReadOnly;
 };
 
-// What is mounted at exactly that directory, the topmost where there are several, as /proc/self/mountinfo has it.
+// Everything that is mounted, as /proc/self/mountinfo has it.
+std::vector<TMount> MountsIn(std::string const& mountInfo);
+std::vector<TMount> Mounts();
+
+// What is mounted at exactly that directory, the topmost where there are several.
 std::optional<TMount> MountIn(std::string const& mountInfo, std::string const& directory);
 std::optional<TMount> MountAt(std::string const& directory);
 

@@ -92,12 +92,15 @@ int Mount(std::string const& device, bool asJson) {
   return kExitComplete;
 }
 
-int Unmount(std::string const& directory, bool asJson) {
-  UnmountDirectory(directory);
+int Unmount(std::string const& argument, bool asJson) {
+  std::string const directory = WithoutTrailingSlashes(argument);
+  std::vector<std::string> const stillMountedAt = UnmountDirectory(directory);
   TJson document = DocumentHead("zep media umount");
   document["mountPoint"] = directory;
-  WriteOutput(asJson ? zep::AsText(document) : directory + " is unmounted; the medium can be taken out\n");
-  return kExitComplete;
+  document["stillMountedAt"] = stillMountedAt;
+  WriteOutput(asJson ? zep::AsText(document)
+                     : directory + " is unmounted; the medium " + WhetherToTakeOut(stillMountedAt) + "\n");
+  return stillMountedAt.empty() ? kExitComplete : kExitPartial;
 }
 
 int Media(TArguments const& arguments) {
@@ -121,9 +124,10 @@ TRun AddMediaArguments(CLI::App& command) {
   command.require_subcommand(0, 1);
   command.footer(
       "Listed are USB disks, floppies and CD-ROMs with a medium, as lsblk shows them. Mounting needs root.\n"
-      "Exit status: 0 when it was done, 2 when labels are missing from the list, 1 when there is no medium or it could\n"
-      "not be done, 64 for wrong usage, which a name with other characters than letters, digits, \"/\", \"-\", \"_\" and\n"
-      "\".\" is, or a device that is not below /dev, or a directory that is not below /mnt, /media or /run/media.");
+      "Exit status: 0 when it was done, 2 when labels are missing from the list or when the drive of what was\n"
+      "unmounted is mounted elsewhere too, 1 when there is no medium or it could not be done, 64 for wrong usage,\n"
+      "which a name with other characters than letters, digits, \"/\", \"-\", \"_\" and \".\" is, or a device that is\n"
+      "not below /dev, or a directory that is not below /mnt, /media or /run/media.");
   return [arguments] { return Media(*arguments); };
 }
 

@@ -3,14 +3,19 @@
 #include "Failure.h"
 #include "Text.h"
 
+#include <poll.h>
+#include <signal.h>
+#include <sys/signalfd.h>
 #include <termios.h>
 #include <unistd.h>
 
 #include <cctype>
+#include <cerrno>
 #include <cstdlib>
 #include <fstream>
 #include <iostream>
 #include <string_view>
+#include <system_error>
 
 namespace NQRVZEP20::zep {
 
@@ -95,6 +100,15 @@ void ReadAuthority(std::string const& text, TRemote& remote) {
   CheckPort(remote.fPort);
 }
 
+// "u:12/w@h" has a user and a password with a "/" in it, or else the port 12 and a path with an "@": the one would be told to a
+// host "u".
+void CheckForPassword(std::string const& authority, std::string const& path) {
+  bool const hasPort = authority.find(':', authority.front() == '[' ? authority.find(']') : 0) != authority.npos;
+  bool const hasUser = authority.find('@') != authority.npos;
+  if (hasPort && !hasUser && path.find('@') != path.npos)
+    throw TWrongUsage("is that a password? A \"/\" in one is written %2F, an \"@\" in a path %40");
+}
+
 // ---- Passwords ----
 
 std::string DefaultNetrc() {
@@ -138,29 +152,70 @@ TLogin LoginOf(TRemote const& remote, std::string const& netrcFile) {
   return {};
 }
 
+// While it lives, the signals that end or stop a program wait; each that came has its effect at the end.
+class TSignalsLater {
+public:
+  TSignalsLater() {
+    ::sigemptyset(&fSignals);
+    for (int const signal : {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGTSTP}) ::sigaddset(&fSignals, signal);
+    ::sigprocmask(SIG_BLOCK, &fSignals, &fBefore);
+  }
+  ~TSignalsLater() { ::sigprocmask(SIG_SETMASK, &fBefore, nullptr); }
+  TSignalsLater(TSignalsLater const&) = delete;
+  TSignalsLater& operator=(TSignalsLater const&) = delete;
+
+  sigset_t const& Signals() const { return fSignals; }
+
+private:
+  sigset_t fSignals, fBefore;
+};
+
 // While it lives, the terminal on standard input shows nothing of what is typed.
 class TNoEcho {
 public:
   TNoEcho() {
-    ::tcgetattr(STDIN_FILENO, &fSettings);
+    if (::tcgetattr(STDIN_FILENO, &fSettings) != 0) ThrowNoTerminal();
     termios settings = fSettings;
     settings.c_lflag &= ~static_cast<tcflag_t>(ECHO);
-    ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &settings);
+    if (::tcsetattr(STDIN_FILENO, TCSAFLUSH, &settings) != 0) ThrowNoTerminal();
   }
   ~TNoEcho() { ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &fSettings); }
   TNoEcho(TNoEcho const&) = delete;
   TNoEcho& operator=(TNoEcho const&) = delete;
 
 private:
-  termios fSettings{};
+  [[noreturn]] static void ThrowNoTerminal() {
+    throw std::system_error(errno, std::generic_category(), "the terminal cannot be kept from showing a password");
+  }
+
+  termios fSettings;
 };
 
-std::string AskForPassword(TRemote const& remote) {
+// Waits until a line is typed; false when a signal comes first.
+bool IsLineTyped(sigset_t const& signals) {
+  int const signalFile = ::signalfd(-1, &signals, SFD_CLOEXEC);
+  if (signalFile < 0) throw std::system_error(errno, std::generic_category(), "no wait for signals");
+  pollfd waiting[] = {{STDIN_FILENO, POLLIN, 0}, {signalFile, POLLIN, 0}};
+  ::poll(waiting, 2, -1);
+  ::close(signalFile);
+  return waiting[1].revents == 0;
+}
+
+// Whether there is an answer: none when a signal came, which has its effect before this returns.
+bool HasAnswer(TRemote const& remote, std::string& password) {
+  TSignalsLater const later;
   TNoEcho const noEcho;
   std::cerr << "Password of " << Printable(remote.fUser) << " at " << Printable(remote.fHost) << ": " << std::flush;
-  std::string password;
-  std::getline(std::cin, password);
+  bool const isTyped = IsLineTyped(later.Signals());
+  if (isTyped) std::getline(std::cin, password);
   std::cerr << "\n";
+  return isTyped;
+}
+
+std::string AskForPassword(TRemote const& remote) {
+  std::string password;
+  while (!HasAnswer(remote, password)) {
+  }  // zep was stopped and goes on
   return password;
 }
 
@@ -173,7 +228,9 @@ TRemote RemoteOf(std::string const& text, std::string const& schemeOtherwise) {
   std::string const rest = colon == text.npos ? text : text.substr(colon + 3);
   std::size_t const slash = rest.find('/');
   ReadAuthority(rest.substr(0, slash), remote);
-  if (slash != rest.npos) remote.fPath = EncodedPath(rest.substr(slash + 1));
+  if (slash == rest.npos) return remote;
+  CheckForPassword(rest.substr(0, slash), rest.substr(slash + 1));
+  remote.fPath = EncodedPath(rest.substr(slash + 1));
   return remote;
 }
 

@@ -44,8 +44,8 @@ std::string FileNameOf(TReport const& report, bool asJson) {
   return "zep-report-" + host.substr(0, 64) + time + (asJson ? ".json" : ".txt");
 }
 
-// Also unmounts a medium that could not be written; the reason for that is the one that counts.
-void WriteAndUnmount(TMountedMedium const& medium, std::string const& name, std::string const& text) {
+// Where it is still mounted. Also unmounts a medium that could not be written; the reason for that is the one that counts.
+std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::string const& name, std::string const& text) {
   try {
     medium.Write(name, text);
   } catch (std::runtime_error const&) {
@@ -56,21 +56,27 @@ void WriteAndUnmount(TMountedMedium const& medium, std::string const& name, std:
     }
     throw;
   }
-  UnmountDirectory(medium.MountPoint());
+  try {
+    return UnmountDirectory(medium.MountPoint());
+  } catch (std::runtime_error const& failure) {
+    throw std::runtime_error(name + " is written on " + medium.Device() + ", but " + failure.what());
+  }
 }
 
 void WriteToMedium(TReport const& report, TArguments const& arguments) {
   std::string const name = FileNameOf(report, arguments.fAsJson);
   std::string const text = arguments.fAsJson ? ReportAsJson(report) : ReportAsText(report);
   TMountedMedium const medium(arguments.fMedium);
-  WriteAndUnmount(medium, name, text);
+  std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);
 
   TJson document = DocumentHead("zep report --to-media");
   document["device"] = medium.Device();
   document["file"] = name;
   document["bytes"] = text.size();
+  document["stillMountedAt"] = stillMountedAt;
+  std::string const whetherToTakeOut = WhetherToTakeOut(stillMountedAt);
   WriteOutput(arguments.fAsJson ? AsText(document)
-                                : "The report is " + name + " on " + medium.Device() + ", which can be taken out.\n");
+                                : "The report is " + name + " on " + medium.Device() + ", which " + whetherToTakeOut + ".\n");
 }
 
 int Report(TArguments const& arguments) {
@@ -99,11 +105,12 @@ TRun AddReportArguments(CLI::App& command) {
                      "[USER@]HOST[:PORT] alone. When it cannot be sent it is kept, and where is said");
   command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
   AddTransferOptions(command, arguments->fOptions);
+  command.allow_extras();  // HasExtras refuses them
   command.footer(
       "Exit status: 0 when everything could be told, 2 when the report says what is missing, 1 when nothing\n"
-      "could be told or the medium could not be written, 64 for wrong usage; when it could not be sent, as that\n"
-      "of zep send.");
-  return [arguments] { return Report(*arguments); };
+      "could be told or the medium could not be written and unmounted, 64 for wrong usage; when it could not be\n"
+      "sent, as that of zep send.");
+  return [&command, arguments] { return HasExtras(command) ? kExitUsage : Report(*arguments); };
 }
 
 }  // namespace NQRVZEP20::zep

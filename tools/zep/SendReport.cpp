@@ -1,6 +1,7 @@
 #include "SendReport.h"
 
 #include "TOSSpecific.h"
+#include "TZEPException.h"
 #include "Text.h"
 
 #include <stdlib.h>
@@ -49,9 +50,28 @@ void WriteReport(TReport const& report, std::string const& file) {
 // The file that gzip makes of this one; the file itself when it makes none.
 std::string Packed(std::string const& file) {
   std::string complaints;
-  if (TOSSpecific::SpawnProcess("gzip", {"-n", file}, complaints, -1) == 0) return file + ".gz";
+  try {
+    if (TOSSpecific::SpawnProcess("gzip", {"-n", file}, complaints, -1) == 0) return file + ".gz";
+  } catch (TZEPException const& failure) {
+    complaints = failure.what();
+  }
   std::cerr << "zep: the report could not be packed: " << Printable(complaints) << "\n";
   return file;
+}
+
+void SayWhereItIsKept(std::string const& file) { std::cerr << "zep: the report is kept in " << Printable(file) << "\n"; }
+
+TTransferred SendOrSayWhereItIsKept(std::string const& file, TTarget const& target, TTransferOptions const& options) {
+  try {
+    TTransferred const sent = SendFile(file, target, "", options);
+    if (sent.fOutcome.fExit == kExitComplete) return sent;
+    std::cerr << "zep: " << sent.fUrl << ": " << sent.fOutcome.fReason << "\n";
+    SayWhereItIsKept(file);
+    return sent;
+  } catch (...) {
+    SayWhereItIsKept(file);
+    throw;
+  }
 }
 
 }  // namespace
@@ -59,13 +79,8 @@ std::string Packed(std::string const& file) {
 EExitStatus SendReport(TReport const& report, TTarget const& target, TTransferOptions const& options) {
   std::string const directory = MakeDirectory(), file = directory + "/" + FileName();
   WriteReport(report, file);
-  std::string const packed = Packed(file);
-  TTransferred const sent = SendFile(packed, target, "", options);
-  if (sent.fOutcome.fExit != kExitComplete) {
-    std::cerr << "zep: " << sent.fUrl << ": " << sent.fOutcome.fReason << "\nzep: the report is kept in " << Printable(packed)
-              << "\n";
-    return sent.fOutcome.fExit;
-  }
+  TTransferred const sent = SendOrSayWhereItIsKept(Packed(file), target, options);
+  if (sent.fOutcome.fExit != kExitComplete) return sent.fOutcome.fExit;
   if (!options.fQuiet)
     std::cerr << "zep: sent to " << sent.fUrl << ": " << sent.fBytes << " bytes, SHA-256 " << sent.fSha256 << "\n";
   std::error_code ignored;

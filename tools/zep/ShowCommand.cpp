@@ -4,21 +4,28 @@
 #include "ExitStatus.h"
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
+#include "ICIMMethodDecl.h"
+#include "ICIMParameterDecl.h"
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
+#include "ICIMQualifier.h"
 #include "Json.h"
+#include "MofFile.h"
 #include "Output.h"
 #include "PlugIns.h"
 #include "Sample.h"
 #include "TCIMReference.h"
 #include "TZEPException.h"
 #include "Text.h"
+#include "ValueWords.h"
 
 #include <CLI/CLI.hpp>
 
 #include <iostream>
+#include <map>
 #include <memory>
 #include <set>
+#include <sstream>
 
 namespace NQRVZEP20::zep {
 
@@ -28,6 +35,7 @@ struct TArguments {
   std::string fPath;
   bool fAsJson = false;
   bool fSample = false;
+  std::string fMofFile;
 };
 
 // The namespace that a path names in front of its class; empty when it names none.
@@ -54,8 +62,6 @@ std::string Heading(std::string const& what) {
   return Printable(IsSampleSelected() ? std::string(kSampleLabel) + " " + what : what) + "\n\n";
 }
 
-std::string TextOf(TCIMValue const& value) { return value.IsNull() ? "NULL" : value.ToString(); }
-
 std::string InstanceAsText(TNamespaceView const& view, ICIMInstance const& instance) {
   TTable table({24, 10, 42});
   table.Add({"Property", "Type", "Value"});
@@ -64,7 +70,8 @@ std::string InstanceAsText(TNamespaceView const& view, ICIMInstance const& insta
         std::string const name = property->GetName(TCIMContext());
         TCIMValue const value = property->GetValue(TCIMContext());
         std::string const reason = value.IsNull() ? ": " + view.WhyMissing(instance, name).fReason : "";
-        table.Add({name, NameOf(value.GetType()), TextOf(value) + reason});
+        TValueWords const words(*property->GetDeclaration(TCIMContext()));
+        table.Add({name, NameOf(value.GetType()), words.TextOf(value) + reason});
         return true;
       },
       TCIMContext());
@@ -93,6 +100,69 @@ void ForEachProperty(ICIMClass const& cls, std::vector<boost::shared_ptr<ICIMCla
         TCIMContext());
 }
 
+// The class's own description, in lines, and an empty line; nothing when there is none.
+std::string DescriptionOf(ICIMClass const& cls) {
+  auto const qualifier = cls.GetQualifier("Description", TCIMContext());
+  TCIMValue const value = qualifier ? qualifier->GetValue(TCIMContext()) : TCIMValue();
+  if (value.IsNull()) return "";
+  std::string description = value.ToString();
+  for (char& c : description)
+    if (c == '\t' || c == '\r') c = ' ';
+  std::istringstream paragraphs(description);
+  std::string text;
+  for (std::string paragraph; std::getline(paragraphs, paragraph);)
+    for (std::string const& line : Wrapped(Printable(paragraph), kLineWidth)) text += line + "\n";
+  return text + "\n";
+}
+
+// What the values of the enumerated properties mean.
+std::string ValuesAsText(ICIMClass const& cls, std::vector<boost::shared_ptr<ICIMClass const>> const& lineage) {
+  TTable table({24, 54});
+  ForEachProperty(cls, lineage, [&](ICIMPropertyDecl const& property) {
+    TValueWords const words(property);
+    std::string values;
+    for (auto const& [entry, word] : words.Entries()) values += (values.empty() ? "" : ", ") + entry + " (" + word + ")";
+    if (!values.empty()) table.Add({property.GetName(TCIMContext()), values});
+  });
+  return table.GetText().empty() ? "" : "\nValues\n" + table.GetText();
+}
+
+std::string SignatureOf(ICIMMethodDecl const& method) {
+  std::string parameters;
+  method.EnumerateParameterDecls(
+      [&](boost::shared_ptr<ICIMParameterDecl> parameter) {
+        std::string const className = parameter->GetReferencedClassName(TCIMContext());
+        std::string const type = NameOf(parameter->GetType(TCIMContext())) + (className.empty() ? "" : " to " + className);
+        parameters += (parameters.empty() ? "" : ", ") + type + " " + parameter->GetName(TCIMContext());
+        return true;
+      },
+      TCIMContext());
+  return NameOf(method.GetReturnType(TCIMContext())) + " " + method.GetName(TCIMContext()) + "(" + parameters + ")";
+}
+
+// Every method, inherited ones too; one that a class declares again is shown as it is declared last.
+std::vector<boost::shared_ptr<ICIMMethodDecl>> MethodsOf(std::vector<boost::shared_ptr<ICIMClass const>> const& lineage) {
+  std::vector<boost::shared_ptr<ICIMMethodDecl>> methods;
+  std::map<std::string, std::size_t> numbers;  // in methods, by name
+  for (auto const& ancestor : lineage)
+    ancestor->EnumerateMethodDecls(
+        [&](boost::shared_ptr<ICIMMethodDecl> method) {
+          auto const [place, isNew] = numbers.emplace(method->GetName(TCIMContext()), methods.size());
+          if (isNew) methods.emplace_back();
+          methods[place->second] = method;
+          return true;
+        },
+        TCIMContext());
+  return methods;
+}
+
+std::string MethodsAsText(std::vector<boost::shared_ptr<ICIMClass const>> const& lineage) {
+  std::string text;
+  for (auto const& method : MethodsOf(lineage))
+    for (std::string const& line : Wrapped(Printable(SignatureOf(*method)), kLineWidth)) text += line + "\n";
+  return text.empty() ? "" : "\nMethods\n" + text;
+}
+
 std::string ClassAsText(TNamespaceView const& view, boost::shared_ptr<ICIMClass const> cls) {
   auto const lineage = LineageOf(cls);
   std::string const name = cls->GetName(TCIMContext());
@@ -103,23 +173,37 @@ std::string ClassAsText(TNamespaceView const& view, boost::shared_ptr<ICIMClass 
   table.Add({"Property", "Type", "Key", "Default"});
   ForEachProperty(*cls, lineage, [&](ICIMPropertyDecl const& property) {
     table.Add({property.GetName(TCIMContext()), NameOf(property.GetType(TCIMContext())),
-               property.IsKey(TCIMContext()) ? "key" : "", TextOf(property.GetDefaultValue(TCIMContext()))});
+               property.IsKey(TCIMContext()) ? "key" : "",
+               TValueWords(property).TextOf(property.GetDefaultValue(TCIMContext()))});
   });
 
-  std::string text = Heading(heading) + table.GetText() + "\nInstances\n";
+  std::string text = Heading(heading) + DescriptionOf(*cls) + table.GetText() + ValuesAsText(*cls, lineage) +
+                     MethodsAsText(lineage) + "\nInstances\n";
   auto const instances = view.InstancesOf(name);
   for (auto const& instance : instances) text += Printable(view.PathOf(*instance)) + "\n";
   if (instances.empty()) text += Printable("none: " + view.WhyNoInstance(name).fReason) + "\n";
   return text;
 }
 
+TJson ValuesAsJson(TValueWords const& words) {
+  TJson values = TJson::array();
+  for (auto const& [entry, word] : words.Entries()) values.push_back({{"value", entry}, {"word", word}});
+  return values;
+}
+
 TJson ClassAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMClass const> cls) {
+  auto const lineage = LineageOf(cls);
   TJson properties = TJson::object();
-  ForEachProperty(*cls, LineageOf(cls), [&](ICIMPropertyDecl const& property) {
-    properties[property.GetName(TCIMContext())] = {{"type", NameOf(property.GetType(TCIMContext()))},
-                                                   {"key", property.IsKey(TCIMContext())},
-                                                   {"default", ValueAsJson(property.GetDefaultValue(TCIMContext()))}};
+  ForEachProperty(*cls, lineage, [&](ICIMPropertyDecl const& property) {
+    TJson& json = properties[property.GetName(TCIMContext())];
+    json = {{"type", NameOf(property.GetType(TCIMContext()))},
+            {"key", property.IsKey(TCIMContext())},
+            {"default", ValueAsJson(property.GetDefaultValue(TCIMContext()))}};
+    TValueWords const words(property);
+    if (!words.Entries().empty()) json["values"] = ValuesAsJson(words);
   });
+  TJson methods = TJson::array();
+  for (auto const& method : MethodsOf(lineage)) methods.push_back(SignatureOf(*method));
   std::string const name = cls->GetName(TCIMContext());
   TJson instances = TJson::array();
   for (auto const& instance : view.InstancesOf(name)) instances.push_back(view.PathOf(*instance));
@@ -129,6 +213,7 @@ TJson ClassAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMClass const>
           {"provider", view.GetProviderName()},
           {"superClass", superClass ? TJson(superClass->GetName(TCIMContext())) : TJson(nullptr)},
           {"properties", properties},
+          {"methods", methods},
           {"instances", instances}};
 }
 
@@ -155,13 +240,16 @@ std::string ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElem
 
 int Show(TArguments const& arguments) {
   if (arguments.fSample) SelectSample();
-  for (TNamespaceView const& view : ViewsOf(LoadPlugIns())) {
+  bool const isMof = !arguments.fMofFile.empty();
+  auto const views = isMof ? std::vector<TNamespaceView>{ViewOfMof(arguments.fMofFile)} : ViewsOf(LoadPlugIns());
+  for (TNamespaceView const& view : views) {
     auto const element = Find(view, arguments.fPath);
     if (!element) continue;
     WriteOutput(arguments.fAsJson ? ElementAsJson(view, element) : ElementAsText(view, element));
     return kExitComplete;
   }
-  std::cerr << "zep: no provider has the object \"" << Printable(arguments.fPath) << "\"\n";
+  std::cerr << "zep: " << (isMof ? Printable(arguments.fMofFile) + " has no" : "no provider has the") << " object \""
+            << Printable(arguments.fPath) << "\"\n";
   return kExitNothing;
 }
 
@@ -174,7 +262,9 @@ TRun AddShowArguments(CLI::App& command) {
                   "A class, such as CIM_Chassis, or the path of an object as zep report --json prints it")
       ->required();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
-  command.add_flag("--sample", arguments->fSample, "Show objects of the bundled table of an invented server, labelled SAMPLE");
+  auto* const mof = command.add_option("--mof", arguments->fMofFile, "Show what this MOF file declares, not what providers have");
+  command.add_flag("--sample", arguments->fSample, "Show objects of the bundled table of an invented server, labelled SAMPLE")
+      ->excludes(mof);
   command.footer("Exit status: 0 when there is such an object, 1 when there is none, 64 for wrong usage.");
   return [arguments] { return Show(*arguments); };
 }

@@ -1,11 +1,12 @@
 #include "TMountedMedium.h"
 
+#include "Drives.h"
 #include "Failure.h"
 #include "TOSSpecific.h"
 #include "TZEPException.h"
+#include "Text.h"
 
 #include <fcntl.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -45,28 +46,36 @@ std::string MountPointOf(std::string const& device) {
   return isFloppy ? "/mnt/floppy" : "/mnt/key";
 }
 
-// The number of a block device; 0 for what is none.
-std::uint64_t NumberOf(std::string const& path) {
-  struct stat status;
-  return ::stat(path.c_str(), &status) == 0 && S_ISBLK(status.st_mode) ? status.st_rdev : 0;
+// What the library tries to mount when the device itself cannot be mounted.
+std::string FirstPartitionOf(std::string const& device) { return device + "1"; }
+
+// Some file systems mount under numbers of their own.
+bool IsMountOf(std::string const& node, TMount const& mount) {
+  std::uint64_t const number = NumberOf(node);
+  return number != 0 && (number == mount.fDevice || number == NumberOf(mount.fSource));
 }
 
-// Whether the mount is that of the device, or of its first partition. Some file systems mount under numbers of their own.
+// Whether the mount is that of the device, or of its first partition.
 bool IsOf(TMount const& mount, std::string const& device) {
-  std::uint64_t const source = NumberOf(mount.fSource);
-  for (std::string const& node : {device, device + "1"}) {
-    std::uint64_t const number = NumberOf(node);
-    if (number != 0 && (number == mount.fDevice || number == source)) return true;
-  }
-  return false;
+  std::string const partition = FirstPartitionOf(device);
+  return IsMountOf(device, mount) || (IsMountOf(partition, mount) && IsPartitionOf(partition, device));
 }
 
 void RefuseOther(std::optional<TMount> const& mount, std::string const& mountPoint, std::string const& device) {
   if (mount && !IsOf(*mount, device)) Throw(mountPoint + " holds " + mount->fSource + "; unmount that first");
 }
 
+// "/dev/sdb11" is no first partition of "/dev/sdb1".
+void RefuseStranger(std::string const& device) {
+  std::string const next = FirstPartitionOf(device);
+  if (NumberOf(next) != 0 && !IsPartitionOf(next, device))
+    Throw(device + " is not mounted: " + next + ", which would be tried as well, is no partition of it");
+}
+
 TMount MountOrThrow(std::string const& device, std::string const& mountPoint) {
-  RefuseOther(MountAt(mountPoint), mountPoint, device);
+  std::optional<TMount> const present = MountAt(mountPoint);
+  RefuseOther(present, mountPoint, device);
+  if (!present) RefuseStranger(device);
   if (!TOSSpecific::IsAdmin()) Throw("only root can mount " + device);
   try {
     if (!TOSSpecific::DirExists(mountPoint)) TOSSpecific::CreateDir(mountPoint);
@@ -76,7 +85,7 @@ TMount MountOrThrow(std::string const& device, std::string const& mountPoint) {
   try {
     TOSSpecific::MountDevice(device);
   } catch (TZEPException const&) {
-    Throw(device + " cannot be mounted: neither it nor " + device + "1 has a file system that can be read");
+    Throw(device + " cannot be mounted: neither it nor " + FirstPartitionOf(device) + " has a file system that can be read");
   }
   std::optional<TMount> const mount = MountAt(mountPoint);
   if (!mount) Throw(device + " was not mounted: a mount point whose name ends in " + mountPoint + " is in the way");
@@ -102,6 +111,14 @@ void WriteAll(int fd, std::string const& contents, std::string const& what) {
     ThrowIf(count < 0, what);
     done += static_cast<std::size_t>(count);
   }
+}
+
+// To a name that nothing has yet. Some file systems in user space cannot see to that by themselves.
+void RenameToNew(int directory, std::string const& from, std::string const& to, std::string const& what) {
+  if (::renameat2(directory, from.c_str(), directory, to.c_str(), RENAME_NOREPLACE) == 0) return;
+  ThrowIf(errno != EINVAL && errno != ENOSYS, what);
+  if (::faccessat(directory, to.c_str(), F_OK, AT_SYMLINK_NOFOLLOW) == 0) errno = EEXIST;
+  ThrowIf(errno != ENOENT || ::renameat(directory, from.c_str(), directory, to.c_str()) != 0, what);
 }
 
 // Some file systems cannot be asked to sync a directory; syncing the whole of them then has to do.
@@ -132,7 +149,7 @@ void TMountedMedium::Write(std::string const& name, std::string const& contents)
   try {
     WriteAll(file.Get(), contents, what);
     ThrowIf(::fsync(file.Get()) != 0, what);
-    ThrowIf(::renameat2(directory.Get(), draft.c_str(), directory.Get(), name.c_str(), RENAME_NOREPLACE) != 0, what);
+    RenameToNew(directory.Get(), draft, name, what);
     present = name;
     SyncDirectory(directory.Get(), what);
   } catch (std::runtime_error const&) {
@@ -141,12 +158,13 @@ void TMountedMedium::Write(std::string const& name, std::string const& contents)
   }
 }
 
-void UnmountDirectory(std::string const& directory) {
+std::vector<std::string> UnmountDirectory(std::string const& directory) {
   CheckDirectory(directory);
   std::optional<TMount> const mount = MountAt(directory);
   if (!mount) Throw("nothing is mounted at " + directory);
   if (!TOSSpecific::IsAdmin()) Throw("only root can unmount " + directory);
 
+  TDrives const drives = DrivesOf(*mount);
   // Opened before: it then tells of what could not be written while unmounting.
   TFile const source(AT_FDCWD, mount->fSource, O_RDONLY | O_NONBLOCK);
   try {
@@ -155,6 +173,14 @@ void UnmountDirectory(std::string const& directory) {
     Throw(directory + " cannot be unmounted: something still uses it");
   }
   if (source.Get() >= 0) ThrowIf(::fsync(source.Get()) != 0, mount->fSource + " is unmounted, but was not written to its end");
+  return MountPointsOf(drives);
+}
+
+std::string WhetherToTakeOut(std::vector<std::string> const& stillMountedAt) {
+  if (stillMountedAt.empty()) return "can be taken out";
+  std::string text = "is still mounted at";
+  for (std::string const& mountPoint : stillMountedAt) text += " " + Printable(mountPoint);
+  return text;
 }
 
 }  // namespace NQRVZEP20::zep

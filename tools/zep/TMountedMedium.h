@@ -26,7 +26,11 @@ private:
 };
 
 // Unmounts what is mounted at a directory below /mnt, /media or /run/media (TWrongUsage for any other). When it returns,
-// everything is on the medium, and it can be taken out.
-void UnmountDirectory(std::string const& directory);
+// everything is on the medium. The result is where the medium, or another partition of it, is mounted still: none when it
+// can be taken out.
+std::vector<std::string> UnmountDirectory(std::string const& directory);
+
+// "can be taken out", or "is still mounted at /media/a".
+std::string WhetherToTakeOut(std::vector<std::string> const& stillMountedAt);
 
 }  // namespace NQRVZEP20::zep

@@ -8,6 +8,7 @@
 
 #include <fcntl.h>
 #include <linux/fs.h>
+#include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -92,6 +93,8 @@ TTransferred Failed(TTransferred transferred, EExitStatus exit, std::string cons
   return transferred;
 }
 
+bool IsSameFile(struct stat const& a, struct stat const& b) { return a.st_dev == b.st_dev && a.st_ino == b.st_ino; }
+
 // ---- Sending ----
 
 // Why a file cannot be sent; empty when it can.
@@ -101,9 +104,10 @@ std::string WhyNotReadable(std::string const& file, struct stat& status) {
   return ::access(file.c_str(), R_OK) == 0 ? "" : ReasonOf(errno);
 }
 
-bool IsSame(struct stat const& a, struct stat const& b) {
-  return a.st_ino == b.st_ino && a.st_size == b.st_size && a.st_mtim.tv_sec == b.st_mtim.tv_sec &&
-         a.st_mtim.tv_nsec == b.st_mtim.tv_nsec;
+bool IsAsBefore(std::string const& file, struct stat const& before) {
+  struct stat now;
+  return ::stat(file.c_str(), &now) == 0 && IsSameFile(now, before) && now.st_size == before.st_size &&
+         now.st_mtim.tv_sec == before.st_mtim.tv_sec && now.st_mtim.tv_nsec == before.st_mtim.tv_nsec;
 }
 
 void AddName(TRemote& remote, std::string const& name) {
@@ -122,6 +126,52 @@ TZEPStatusCode Send(std::string const& file, TTarget const& target) {
 }
 
 // ---- Fetching ----
+
+// A file that only one process at a time can have open so, and that is gone when it is done. One that a killed process left
+// is no hindrance.
+class TLockFile {
+public:
+  explicit TLockFile(std::string path) : fPath(std::move(path)) {
+    while (Open() && !IsStillThere()) Close();  // the one that had it has just removed it
+  }
+  ~TLockFile() {
+    if (fFile < 0) return;
+    ::unlink(fPath.c_str());
+    Close();
+  }
+  TLockFile(TLockFile const&) = delete;
+  TLockFile& operator=(TLockFile const&) = delete;
+
+  std::string const& WhyNotHad() const { return fWhyNotHad; }  // empty when it is
+
+private:
+  bool Open() {
+    fFile = ::open(fPath.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0666);
+    if (fFile >= 0 && ::flock(fFile, LOCK_EX | LOCK_NB) == 0) return true;
+    fWhyNotHad = errno == EWOULDBLOCK ? "another transfer into the file goes on" : ReasonOf(errno);
+    Close();
+    return false;
+  }
+  void Close() {
+    if (fFile >= 0) ::close(fFile);
+    fFile = -1;
+  }
+  bool IsStillThere() const {
+    struct stat held, named;
+    return ::fstat(fFile, &held) == 0 && ::stat(fPath.c_str(), &named) == 0 && IsSameFile(held, named);
+  }
+
+  std::string fPath, fWhyNotHad;
+  int fFile = -1;
+};
+
+// The library asks about a file that is in the way, which can only be one that somebody else has made just now: it meets the
+// end of the input, and returns without a transfer.
+TZEPStatusCode Fetch(std::string const& url, std::string const& part) {
+  std::cin.clear();
+  TOSSpecific::CurlTransferFile(url, part, true);
+  return std::cin.eof() ? kZEPStatusAlreadyExists : kZEPStatusOK;
+}
 
 // Gives the file its name, in place of another one only when that is wanted.
 bool Rename(std::string const& from, std::string const& to, bool overwrites) {
@@ -169,7 +219,10 @@ std::string PartText(std::string const& part) {
 
 void AddTransferOptions(CLI::App& command, TTransferOptions& options) {
   command.add_flag("--quiet", options.fQuiet, "No progress, and no word when all went well");
-  command.add_option("--stall", options.fStallSeconds, "The longest standstill allowed, in seconds (60); 0 waits for ever")
+  command
+      .add_option("--stall", options.fStallSeconds,
+                  "The longest standstill allowed, in seconds (60); 0 waits for ever. What is sent counts as moved when\n"
+                  "it is read: the last few MiB must reach a slow server within that time")
       ->check(CLI::Range(0, 86400));
   command.add_option("--netrc", options.fNetrc, "The file with users and passwords ($NETRC, else ~/.netrc)");
 }
@@ -199,7 +252,7 @@ TTarget TargetOf(std::string const& text, bool bySftp) {
 TTransferred SendFile(std::string const& file, TTarget target, std::string const& name, TTransferOptions const& options) {
   AddName(target.fRemote, name.empty() ? fs::path(file).filename().string() : name);
   TTransferred transferred = TransferOf(target.fRemote, file);
-  struct stat before, after;
+  struct stat before;
   std::string const why = WhyNotReadable(file, before);
   if (!why.empty()) return Failed(transferred, kExitNoInput, why);
   transferred.fBytes = static_cast<std::uint64_t>(before.st_size);
@@ -212,9 +265,9 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
     if (wasReached) transferred.fOutcome.fReason += "; the server may have a part of it";
     return transferred;
   }
-  transferred.fSha256 = Sha256Of(file);
-  if (::stat(file.c_str(), &after) != 0 || !IsSame(before, after))
-    return Failed(transferred, kExitPartial, "the file changed while it was sent");
+  bool const isAsBefore = IsAsBefore(file, before);
+  if (isAsBefore) transferred.fSha256 = Sha256Of(file);
+  if (!isAsBefore || !IsAsBefore(file, before)) return Failed(transferred, kExitPartial, "the file changed while it was sent");
   return transferred;
 }
 
@@ -223,16 +276,15 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
   TTransferred transferred = TransferOf(remote, part);
   FindPassword(remote, options.fNetrc);
   transferred.fUrl = ShownUrlOf(remote);
+  TLockFile const lock(part + ".lock");
+  if (!lock.WhyNotHad().empty()) return Failed(transferred, kExitNotWritten, lock.WhyNotHad());
   // A part that an earlier transfer left goes: the library would ask what is to become of it.
   if (::unlink(part.c_str()) != 0 && errno != ENOENT) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
   if (!MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
   ::unlink(part.c_str());
-  transferred.fOutcome = Transfer(
-      [&] {
-        TOSSpecific::CurlTransferFile(UrlOf(remote), part, true);
-        return kZEPStatusOK;
-      },
-      transferred, remote.fPassword, false, options);
+  transferred.fOutcome = Transfer([&] { return Fetch(UrlOf(remote), part); }, transferred, remote.fPassword, false, options);
+  if (transferred.fOutcome.fStatus == kZEPStatusAlreadyExists)
+    return Failed(transferred, kExitNotWritten, "another program has made this file meanwhile");
   if (transferred.fOutcome.fExit != kExitComplete) {
     BlameTheDisk(transferred.fOutcome, part);
     transferred.fOutcome.fReason += PartText(part);

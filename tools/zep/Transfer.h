@@ -52,7 +52,7 @@ TTarget TargetOf(std::string const& text, bool bySftp);
 TTransferred SendFile(std::string const& file, TTarget target, std::string const& name, TTransferOptions const& options);
 
 // Fetches what the URL names into the file, by way of the file with ".part" behind its name, which stays when the transfer
-// breaks off. `overwrites`: whether a file may be there.
+// breaks off; one transfer at a time has it. `overwrites`: whether a file may be there.
 TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, TTransferOptions const& options);
 
 // Says on standard output, or as one JSON document, what became of a transfer, and on standard error why it failed. Returns

@@ -9,6 +9,7 @@
 #include <poll.h>
 #include <signal.h>
 #include <sys/prctl.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -73,15 +74,22 @@ std::string ReportOf(std::function<TZEPStatusCode()> const& transfer) {
 
 // ---- In zep ----
 
-// How far a process has read the file.
-std::uint64_t PositionIn(fs::path const& file, pid_t process) {
+struct stat StatusOf(std::string const& path) {
+  struct stat status {};
+  ::stat(path.c_str(), &status);  // of a file that is not there all is 0
+  return status;
+}
+
+bool IsSameFile(struct stat const& a, struct stat const& b) { return a.st_dev == b.st_dev && a.st_ino == b.st_ino; }
+
+// How far a process has read the file, whatever its name is by now.
+std::uint64_t PositionIn(struct stat const& file, pid_t process) {
   std::error_code gone;
   std::uint64_t position = 0;
   std::string const directory = "/proc/" + std::to_string(process);
   for (auto entry = fs::directory_iterator(directory + "/fd", gone); !gone && entry != fs::directory_iterator();
        entry.increment(gone)) {
-    std::error_code closed;
-    if (fs::read_symlink(entry->path(), closed) != file) continue;
+    if (!IsSameFile(StatusOf(entry->path()), file)) continue;
     std::ifstream info(directory + "/fdinfo/" + entry->path().filename().string());
     std::string word;
     std::uint64_t number = 0;
@@ -90,10 +98,11 @@ std::uint64_t PositionIn(fs::path const& file, pid_t process) {
   return position;
 }
 
-// What moves during a transfer: the position in a file that is sent, the size of one that is fetched.
-std::uint64_t BytesMoved(TWatch const& watch, pid_t process) {
+// What moves during a transfer: the position in a file that is sent, which was `file` at the start; the size of one that is
+// fetched.
+std::uint64_t BytesMoved(TWatch const& watch, struct stat const& file, pid_t process) {
   std::error_code absent;
-  if (watch.fIsUpload) return PositionIn(fs::canonical(watch.fFile, absent), process);
+  if (watch.fIsUpload) return PositionIn(file, process);
   std::uintmax_t const size = fs::file_size(watch.fFile, absent);
   return absent ? 0 : size;
 }
@@ -119,7 +128,8 @@ TOutcome Stalled(TWatch const& watch) {
 
 // Reads the report until the child is done; false when it stood still for too long.
 bool ReadReport(int end, pid_t process, TWatch const& watch, std::string& report) {
-  std::uint64_t last = BytesMoved(watch, process);
+  struct stat const file = StatusOf(watch.fFile);
+  std::uint64_t last = BytesMoved(watch, file, process);
   TClock::time_point lastMoved = TClock::now();
   pollfd waiting{end, POLLIN, 0};
   char chunk[4096];
@@ -130,7 +140,7 @@ bool ReadReport(int end, pid_t process, TWatch const& watch, std::string& report
       report.append(chunk, static_cast<std::size_t>(got));
       continue;
     }
-    std::uint64_t const now = BytesMoved(watch, process);
+    std::uint64_t const now = BytesMoved(watch, file, process);
     if (watch.fShowProgress) watch.fShowProgress(now);
     if (now != last) lastMoved = TClock::now();
     last = now;

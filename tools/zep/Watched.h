@@ -15,8 +15,10 @@ constexpr int kUsualStallSeconds = 60;
 struct TWatch {
   std::string fFile;  // the local file: a download lets it grow, an upload reads it
   bool fIsUpload = false;
-  std::string fSecret;                                     // a password, which no reason is to show
-  int fStallSeconds = kUsualStallSeconds;                  // the longest standstill allowed; 0: for ever
+  std::string fSecret;  // a password, which no reason is to show
+  // The longest standstill allowed; 0: for ever. When an upload has read its last byte, nothing moves any more: what the system
+  // still holds back for a slow line goes out unseen, and must have gone by then.
+  int fStallSeconds = kUsualStallSeconds;
   std::function<void(std::uint64_t bytes)> fShowProgress;  // of that file, now and then; may be empty
 };
 

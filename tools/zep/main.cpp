@@ -20,7 +20,9 @@ namespace {
 
 constexpr TCommand kCommands[] = {
     {"report", "Tell which machine this is", AddReportArguments},
-    {"show", "Print one object or class of the providers' namespaces", AddShowArguments},
+    {"show", "Print one object or class of the providers' namespaces, or of a MOF file", AddShowArguments},
+    {"classes", "List the classes of the providers' namespaces, or of a MOF file", AddClassesArguments},
+    {"mof", "Load and check a schema in MOF", AddMofArguments},
     {"media", "List, mount and unmount removable media", AddMediaArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},
     {"remote", "Tell which machines are behind management controllers", AddRemoteArguments},

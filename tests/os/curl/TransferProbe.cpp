@@ -1,6 +1,7 @@
 // Downloads twice with the library and the libcurl that it is led to, and tells what came of it.
 //
 //   TransferProbe [FROM TO]      links TO to the file FROM between the two
+//   TransferProbe --proxy        checks a proxy instead
 
 #include "TOSSpecific.h"
 #include "TZEPException.h"
@@ -12,9 +13,12 @@
 
 using namespace NQRVZEP20;
 
-static void Try() {
+static void Download() { TOSSpecific::CurlTransferFile("ftp://127.0.0.1/x", "no/such/file", true); }
+static void CheckProxy() { TOSSpecific::CheckProxySetting("127.0.0.1", "1", "u:p", 0); }
+
+static void Try(void (*operation)()) {
   try {
-    TOSSpecific::CurlTransferFile("ftp://127.0.0.1/x", "no/such/file", true);
+    operation();
     std::puts("done");
   } catch (TZEPException const& failure) {
     std::puts(failure.what());
@@ -24,7 +28,8 @@ static void Try() {
 }
 
 int main(int argc, char** argv) {
-  Try();
+  auto const operation = argc == 2 ? CheckProxy : Download;
+  Try(operation);
   if (argc == 3 && ::symlink(argv[1], argv[2]) != 0) return 1;
-  Try();
+  Try(operation);
 }

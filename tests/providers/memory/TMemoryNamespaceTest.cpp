@@ -146,7 +146,7 @@ TEST(TMemoryNamespaceTest, QualifierDeclarationsAreEnumeratedInTheOrderOfCreatio
   EXPECT_THAT(Names(*ns, &ICIMNamespace::EnumerateQualifierDecls), ElementsAre("Zeta", "Alpha"));
   EXPECT_EQ(VisitsUntilSecond(*ns, &ICIMNamespace::EnumerateQualifierDecls), 2);
   EXPECT_EQ(ns->GetQualifierDecl("ALPHA", kNone), alpha);
-  EXPECT_STATUS(ns->GetQualifierDecl("Beta", kNone), kZEPStatusNotFound);
+  EXPECT_FALSE(ns->GetQualifierDecl("Beta", kNone));
 }
 
 TEST(TMemoryNamespaceTest, QualifierDeclarationIsRefusedWithItsReason) {

@@ -5,18 +5,24 @@
 //   MediaProbe ids DEVICEID...         the same for a namespace of disks with these identifiers
 //   MediaProbe mount DEVICE
 //   MediaProbe umount DEVICE DIRECTORY
+//   MediaProbe eject DEVICE            opens the tray of an optical drive
 
 #include "INamespaceProvider.h"
 #include "INamespaceProviderManager.h"
 #include "TOSSpecific.h"
 #include "TRootObject.h"
+#include "core/Handles.h"
 #include "providers/memory/TMemoryNamespace.h"
 #include "tests/Support.h"
 
+#include <fcntl.h>
+#include <linux/cdrom.h>
+#include <sys/ioctl.h>
 #include <boost/make_shared.hpp>
 
 #include <cstdlib>
 #include <iostream>
+#include <stdexcept>
 
 namespace {
 
@@ -56,11 +62,17 @@ boost::shared_ptr<ICIMNamespace> NamespaceOf(TArguments const& ids) {
   return ns;
 }
 
+void Eject(std::string const& device) {
+  TUniqueFd const drive(::open(device.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+  if (!drive || ::ioctl(drive.get(), CDROMEJECT) != 0) throw std::runtime_error("cannot eject " + device);
+}
+
 void Do(std::string const& operation, TArguments const& arguments) {
   if (operation == "virtual") return ListVirtualDevices(std::stoi(arguments.at(0)), arguments.at(1) == "1");
   if (operation == "ids") return Enumerate(NamespaceOf(arguments));
   if (operation == "mount") return void(std::cout << TOSSpecific::MountDevice(arguments.at(0)) << "\n");
   if (operation == "umount") return TOSSpecific::UnmountDevice(arguments.at(0), arguments.at(1));
+  if (operation == "eject") return Eject(arguments.at(0));
   auto const ns = HostNamespace();
   if (!arguments.empty() && std::system(arguments[0].c_str()) != 0) std::cout << "the command failed\n";
   Enumerate(ns);

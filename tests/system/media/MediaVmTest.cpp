@@ -145,6 +145,13 @@ TEST_F(MediaVmTest, ZepListsMediaWithLabelAndMountPoint) {
   EXPECT_EQ(MediumIn(mounted, "/dev/sdc")["mounted"], false);
 }
 
+TEST_F(MediaVmTest, AnEmptyOpticalDriveIsNoMedium) {
+  std::string const full = Result("list-full.json"), empty = Result("list-empty.json");
+  EXPECT_EQ(MediumIn(full, "/dev/sr0")["description"], "QEMU CD-ROM");
+  EXPECT_TRUE(MediumIn(empty, "/dev/sr0").is_null()) << empty;
+  EXPECT_EQ(MediumIn(empty, "/dev/sr1")["description"], "Example Virtual CDROM");
+}
+
 TEST_F(MediaVmTest, ZepMountsAndUnmounts) {
   EXPECT_EQ(Result("zep-mount"), "/dev/sdb1 is mounted at /mnt/key\n/mnt/key is unmounted; the medium can be taken out\n");
 }

@@ -1,9 +1,32 @@
 // zep media and zep report --to-media on loop devices, and media that fail.
 
+#include "ZEPExport.h"
 #include "tests/system/media/MediaSupport.h"
 #include "tests/tools/zep/Zep.h"
+#include "tools/zep/TMountedMedium.h"
 
+#include <dlfcn.h>
 #include <gmock/gmock.h>
+#include <sys/stat.h>
+#include <sys/sysmacros.h>
+
+#include <cerrno>
+#include <cstdio>
+
+namespace {
+int gRenameError = 0;
+}
+
+// Found before that of the C library: fails with gRenameError, if there is one, as file systems in user space do.
+ZEP_EXPORT int renameat2(int oldDirectory, char const* oldName, int newDirectory, char const* newName, unsigned flags) noexcept {
+  if (gRenameError != 0) {
+    errno = gRenameError;
+    return -1;
+  }
+  static auto const next =
+      reinterpret_cast<int (*)(int, char const*, int, char const*, unsigned)>(::dlsym(RTLD_NEXT, "renameat2"));
+  return next(oldDirectory, oldName, newDirectory, newName, flags);
+}
 
 namespace NQRVZEP20::zep {
 namespace {
@@ -37,13 +60,17 @@ protected:
     return Zep(arguments);
   }
 
+  static std::vector<std::string> NamesAt(std::string const& directory) {
+    std::vector<std::string> names;
+    for (auto const& entry : fs::directory_iterator(directory))
+      if (entry.path().filename() != "lost+found") names.push_back(entry.path().filename());
+    return names;
+  }
   // What an image holds, read through another mount.
   static std::vector<std::string> NamesIn(std::string const& image) {
     fs::create_directory("/mnt/look");
     Do("mount -o ro,noload " + image + " /mnt/look");
-    std::vector<std::string> names;
-    for (auto const& entry : fs::directory_iterator("/mnt/look"))
-      if (entry.path().filename() != "lost+found") names.push_back(entry.path().filename());
+    std::vector<std::string> const names = NamesAt("/mnt/look");
     Do("umount /mnt/look");
     fs::remove("/mnt/look");
     return names;
@@ -71,7 +98,7 @@ TEST_F(ZepMediaTest, MountsAndUnmounts) {
               std::string text = Zep({"media", "mount", loop.Path()});
               text += ReadFile("/mnt/key/label.txt") + "\n";
               text += Zep({"media", "mount", loop.Path()});
-              text += Zep({"media", "umount", "/mnt/key"});
+              text += Zep({"media", "umount", "/mnt/key/"});
               text += Zep({"media", "umount", "/mnt/key"});
               return Replaced(text, loop.Path(), "LOOP");
             }),
@@ -109,6 +136,145 @@ TEST_F(ZepMediaTest, AnotherMediumAtTheMountPointIsNeverTakenForTheDevice) {
             "zep: /mnt/key holds FIRST; unmount that first\nexit status 1\nlabel.txt");
 }
 
+// ---- Devices by names of the tests' own ----
+
+// For use in a child: covers /dev/shm and what sysfs has of block devices with file systems of the child's own.
+class TFakeDisks {
+public:
+  TFakeDisks() {
+    if (!MountTmpfs("/dev/shm", "") || !MountTmpfs("/sys/dev", "")) throw std::runtime_error("cannot mount");
+    fs::create_directories("/sys/dev/block");
+  }
+
+  // "/dev/shm/key1" for a loop device.
+  void AddNode(std::string const& name, TLoopDevice const& loop) const {
+    if (::mknod(("/dev/shm/" + name).c_str(), S_IFBLK | 0600, NumberOf(loop)) != 0)
+      throw std::runtime_error("cannot make a node");
+  }
+  // In sysfs at a place such as "key1/key11", which is a partition of key1.
+  void AddPlace(std::string const& place, TLoopDevice const& loop) const {
+    fs::path const path = "/sys/dev/disks/" + place;
+    fs::create_directories(path);
+    if (place.find('/') != place.npos) WriteFile(path / "partition", "1\n");
+    auto const number = NumberOf(loop);
+    std::string const name = std::to_string(major(number)) + ":" + std::to_string(minor(number));
+    fs::create_directory_symlink("../disks/" + place, "/sys/dev/block/" + name);
+  }
+  void AddSlave(std::string const& place, std::string const& slave) const {
+    fs::create_directories("/sys/dev/disks/" + place + "/slaves");
+    fs::create_directory_symlink("/sys/dev/disks/" + slave, "/sys/dev/disks/" + place + "/slaves/slave");
+  }
+
+private:
+  static dev_t NumberOf(TLoopDevice const& loop) {
+    struct stat status;
+    if (::stat(loop.Path().c_str(), &status) != 0) throw std::runtime_error("no " + loop.Path());
+    return status.st_rdev;
+  }
+};
+
+TEST_F(ZepMediaTest, AnotherDevicesPartitionIsNeverTakenForTheFirstOne) {
+  WriteFile(dir_.Path("none"), std::string(1 << 20, '\0'));
+  MakeImage(dir_.Path("other"), "other");
+  EXPECT_EQ(
+      WithZep([&] {
+        TFakeDisks const disks;
+        TLoopDevice const none(dir_.Path("none")), other(dir_.Path("other"));
+        disks.AddNode("key1", none);
+        disks.AddNode("key11", other);
+        disks.AddPlace("key/key1", none);
+        disks.AddPlace("key/key11", other);
+        std::string text = Zep({"media", "mount", "/dev/shm/key1"});
+        text += Report("/dev/shm/key1");
+        text += fs::is_empty("/mnt/key") ? "unmounted\n" : "mounted\n";
+        Do("mount /dev/shm/key11 /mnt/key");
+        text += Zep({"media", "mount", "/dev/shm/key1"});
+        text += Report("/dev/shm/key1");
+        text += Joined(NamesAt("/mnt/key"));
+        Do("umount /mnt/key");
+        return text;
+      }),
+      "zep: /dev/shm/key1 is not mounted: /dev/shm/key11, which would be tried as well, is no partition of it\nexit status 1\n"
+      "zep: /dev/shm/key1 is not mounted: /dev/shm/key11, which would be tried as well, is no partition of it\nexit status 1\n"
+      "unmounted\n"
+      "zep: /mnt/key holds /dev/shm/key11; unmount that first\nexit status 1\n"
+      "zep: /mnt/key holds /dev/shm/key11; unmount that first\nexit status 1\n"
+      "label.txt");
+}
+
+TEST_F(ZepMediaTest, ADevicesOwnFirstPartitionWillDo) {
+  WriteFile(dir_.Path("none"), std::string(1 << 20, '\0'));
+  MakeImage(dir_.Path("part"), "partition");
+  EXPECT_EQ(WithZep([&] {
+              TFakeDisks const disks;
+              TLoopDevice const none(dir_.Path("none")), part(dir_.Path("part"));
+              disks.AddNode("key", none);
+              disks.AddNode("key1", part);
+              disks.AddPlace("key", none);
+              disks.AddPlace("key/key1", part);
+              std::string text = Zep({"media", "mount", "/dev/shm/key"});
+              text += Zep({"media", "mount", "/dev/shm/key"});
+              text += Zep({"media", "umount", "/mnt/key"});
+              return text;
+            }),
+            "/dev/shm/key1 is mounted at /mnt/key\nexit status 0\n"
+            "/dev/shm/key1 is mounted at /mnt/key\nexit status 0\n"
+            "/mnt/key is unmounted; the medium can be taken out\nexit status 0\n");
+}
+
+TEST_F(ZepMediaTest, AMediumThatIsMountedElsewhereTooCannotBeTakenOut) {
+  MakeImage(dir_.Path("key"), "whole");
+  EXPECT_EQ(WithZep([&] {
+              TLoopDevice const loop(dir_.Path("key"));
+              fs::create_directory("/mnt/a");
+              fs::create_directory("/mnt/b c");
+              for (char const* directory : {"/mnt/a", "'/mnt/b c'"}) Do("mount " + loop.Path() + " " + directory);
+              std::string text = Zep({"media", "mount", loop.Path()});
+              text += Zep({"media", "umount", "/mnt/key"});
+              TRun const report = installation_->Run({{"report", "--sample", "--to-media", loop.Path()}});
+              text += "..." + report.output.substr(report.output.find(" on ")) + "exit status " + std::to_string(report.status) +
+                      "\n";
+              Do("umount '/mnt/b c'; mount " + loop.Path() + " /mnt/key");
+              text += JsonOf(installation_->Run({{"media", "umount", "/mnt/key", "--json"}}))["stillMountedAt"].dump() + "\n";
+              TRun const asJson = installation_->Run({{"report", "--json", "--sample", "--to-media", loop.Path()}});
+              text += JsonOf(asJson)["stillMountedAt"].dump() + "\n";
+              text += Zep({"media", "umount", "/mnt/a"});
+              return Replaced(text, loop.Path(), "LOOP");
+            }),
+            "LOOP is mounted at /mnt/key\nexit status 0\n"
+            "/mnt/key is unmounted; the medium is still mounted at /mnt/a /mnt/b c\nexit status 2\n"
+            "... on LOOP, which is still mounted at /mnt/a /mnt/b c.\nexit status 0\n"
+            "[\"/mnt/a\"]\n[\"/mnt/a\"]\n"
+            "/mnt/a is unmounted; the medium can be taken out\nexit status 0\n");
+}
+
+TEST_F(ZepMediaTest, AllPartitionsAndVolumesOfADriveAreTakenOutTogether) {
+  for (char const* name : {"first", "second", "volume", "stranger"}) MakeImage(dir_.Path(name), name);
+  EXPECT_EQ(WithZep([&] {
+              TFakeDisks const disks;
+              TLoopDevice const first(dir_.Path("first")), second(dir_.Path("second")), volume(dir_.Path("volume"));
+              TLoopDevice const stranger(dir_.Path("stranger"));
+              disks.AddPlace("key/key1", first);
+              disks.AddPlace("key/key2", second);
+              disks.AddPlace("other/other1", stranger);
+              disks.AddPlace("volume", volume);
+              disks.AddSlave("volume", "key/key2");
+              for (char const* name : {"a", "b", "c"}) fs::create_directory(std::string("/mnt/") + name);
+              Do("mount " + first.Path() + " /mnt/key; mount " + second.Path() + " /mnt/a; mount " + volume.Path() + " /mnt/b");
+              Do("mount " + stranger.Path() + " /mnt/c");
+              std::string text;
+              for (char const* directory : {"/mnt/key", "/mnt/a", "/mnt/c", "/mnt/b"})
+                text += Zep({"media", "umount", directory});
+              return text;
+            }),
+            "/mnt/key is unmounted; the medium is still mounted at /mnt/a /mnt/b\nexit status 2\n"
+            "/mnt/a is unmounted; the medium is still mounted at /mnt/b\nexit status 2\n"
+            "/mnt/c is unmounted; the medium can be taken out\nexit status 0\n"
+            "/mnt/b is unmounted; the medium can be taken out\nexit status 0\n");
+}
+
+// ---- What cannot be done ----
+
 TEST_F(ZepMediaTest, WhatHasNoFileSystemCannotBeMounted) {
   WriteFile(dir_.Path("key"), std::string(1 << 20, '\0'));
   EXPECT_EQ(WithZep([&] {
@@ -128,7 +294,8 @@ TEST_F(ZepMediaTest, ABusyMediumCannotBeUnmounted) {
                 std::ifstream const user("/mnt/key/label.txt");
                 text = Zep({"media", "umount", "/mnt/key"});
               }
-              return text + Zep({"media", "umount", "/mnt/key"});
+              text += Zep({"media", "umount", "/mnt/key"});
+              return text;
             }),
             "zep: /mnt/key cannot be unmounted: something still uses it\nexit status 1\n"
             "/mnt/key is unmounted; the medium can be taken out\nexit status 0\n");
@@ -243,6 +410,70 @@ TEST_F(ZepMediaTest, ALoopDeviceDetachedInTheMiddleStillGetsTheReport) {
     return run.errors + "exit status " + std::to_string(run.status) + " " + Joined(NamesIn(dir_.Path("key")));
   });
   EXPECT_THAT(text, StartsWith("exit status 0 label.txt zep-report-sample-server-"));
+}
+
+TEST_F(ZepMediaTest, AReportOnABusyMediumIsThereThoughItCannotBeUnmounted) {
+  MakeImage(dir_.Path("key"), "whole");
+  std::string const text = WithZep([&] {
+    TLoopDevice const loop(dir_.Path("key"));
+    Do("mount " + loop.Path() + " /mnt/key");
+    std::string report;
+    {
+      std::ifstream const user("/mnt/key/label.txt");
+      report = Report(loop.Path());
+    }
+    Do("umount /mnt/key");
+    return Replaced(report, loop.Path(), "LOOP") + Joined(NamesIn(dir_.Path("key")));
+  });
+  EXPECT_THAT(text,
+              testing::MatchesRegex("zep: (zep-report-sample-server-[0-9-]*\\.txt) is written on LOOP, but /mnt/key cannot be "
+                                    "unmounted: something still uses it\nexit status 1\nlabel.txt zep-report-.*\\.txt"));
+}
+
+// Some file systems cannot be told to replace nothing.
+TEST_F(ZepMediaTest, NothingIsReplacedOnAnyFileSystem) {
+  MakeImage(dir_.Path("key"), "whole");
+  for (int const error : {0, EINVAL, ENOSYS}) {
+    SCOPED_TRACE(error);
+    EXPECT_EQ(WithZep([&] {
+                TLoopDevice const loop(dir_.Path("key"));
+                TMountedMedium const medium(loop.Path());
+                gRenameError = error;
+                medium.Write("report", "first");
+                std::string text;
+                fs::create_symlink("nowhere", "/mnt/key/link");
+                for (char const* name : {"report", "link"}) try {
+                    medium.Write(name, "second");
+                  } catch (std::runtime_error const& failure) {
+                    text += std::string(failure.what()) + "\n";
+                  }
+                gRenameError = 0;
+                text += ReadFile("/mnt/key/report") + " ";
+                fs::remove("/mnt/key/report");
+                fs::remove("/mnt/key/link");
+                UnmountDirectory("/mnt/key");
+                return Replaced(text, loop.Path(), "LOOP") + Joined(NamesIn(dir_.Path("key")));
+              }),
+              "report cannot be written on LOOP: File exists\nlink cannot be written on LOOP: File exists\nfirst label.txt");
+  }
+}
+
+TEST_F(ZepMediaTest, AnyOtherFailureToRenameIsOne) {
+  MakeImage(dir_.Path("key"), "whole");
+  EXPECT_EQ(WithZep([&] {
+              TLoopDevice const loop(dir_.Path("key"));
+              TMountedMedium const medium(loop.Path());
+              gRenameError = EIO;
+              std::string text;
+              try {
+                medium.Write("report", "first");
+              } catch (std::runtime_error const& failure) {
+                text = failure.what();
+              }
+              UnmountDirectory("/mnt/key");
+              return Replaced(text, loop.Path(), "LOOP") + "\n" + Joined(NamesIn(dir_.Path("key")));
+            }),
+            "report cannot be written on LOOP: Input/output error\nlabel.txt");
 }
 
 TEST_F(ZepMediaTest, ADetachedLoopDeviceIsAFailure) {

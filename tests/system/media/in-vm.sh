@@ -64,6 +64,10 @@ plug_in
 "$zep" media umount /mnt/key >> /out/zep-mount 2>&1
 key_mounts >> /out/zep-mount
 
+"$zep" media --json > /out/list-full.json
+"$probe" eject /dev/sr0
+"$zep" media --json > /out/list-empty.json
+
 {
   "$zep" report --sample --to-media /dev/sdb
   echo "exit status $?"

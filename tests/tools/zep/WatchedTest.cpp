@@ -97,6 +97,35 @@ TEST(RunWatchedTest, MovementIsSeenOnTheFile) {
   }
 }
 
+// Renamed, or without a name at all: what is read of it is seen all the same.
+TEST(RunWatchedTest, AFileThatIsSentMayLoseItsName) {
+  TTempDir const dir;
+  for (bool const isDeleted : {false, true}) {
+    SCOPED_TRACE(isDeleted);
+    WriteFile(dir.Path("f"), std::string(1000, 'x'));
+    std::uint64_t seen = 0;
+    TWatch watch;
+    watch.fFile = dir.Path("f");
+    watch.fIsUpload = true;
+    watch.fStallSeconds = 1;
+    watch.fShowProgress = [&seen](std::uint64_t bytes) { seen = bytes; };
+    TOutcome const outcome = RunWatched(
+        [&] {
+          int const file = ::open(watch.fFile.c_str(), O_RDONLY);
+          ::usleep(300000);  // until zep has looked at it
+          if (std::rename(watch.fFile.c_str(), dir.Path("g").c_str()) != 0) return kZEPStatusFail;
+          if (isDeleted) ::unlink(dir.Path("g").c_str());
+          char bytes[100];
+          for (int steps = 0; steps < 6; ++steps, ::usleep(400000))
+            if (::read(file, bytes, sizeof bytes) != sizeof bytes) return kZEPStatusFail;
+          return kZEPStatusOK;
+        },
+        watch);
+    EXPECT_EQ(outcome.fExit, kExitComplete) << outcome.fReason;
+    EXPECT_EQ(seen, 600u);
+  }
+}
+
 TEST(RunWatchedTest, AStandstillEndsTheTransfer) {
   TTempDir const dir;
   TWatch watch;

@@ -1,0 +1,198 @@
+// The steps of the copy, in the order in which it comes to them.
+
+#include "ICIMClass.h"
+#include "ICIMInstance.h"
+#include "ICIMMethodDecl.h"
+#include "ICIMNamespace.h"
+#include "ICIMParameterDecl.h"
+#include "ICIMProperty.h"
+#include "ICIMPropertyDecl.h"
+#include "ICIMQualifier.h"
+#include "ICIMQualifierDecl.h"
+#include "TAddToVectorCallback.h"
+#include "TCIMCopy.h"
+#include "TCIMReference.h"
+#include "TZEPException.h"
+#include "core/Log.h"
+
+#include <boost/ref.hpp>
+
+#include <vector>
+
+using namespace NQRVZEP20;
+
+namespace {
+
+constexpr char kProductClassName[] = "QRVSG_ZEPProduct";
+constexpr char kPluginNameQualifier[] = "PLUGINNAME";
+constexpr char kOverrideQualifier[] = "OVERRIDE";
+
+// Empty when the namespace is gone; its use is a failed assertion then.
+boost::shared_ptr<ICIMNamespace> Lock(boost::weak_ptr<ICIMNamespace> const& destination) {
+  try {
+    return boost::shared_ptr<ICIMNamespace>(destination);
+  } catch (boost::bad_weak_ptr const&) {
+    return boost::shared_ptr<ICIMNamespace>();
+  }
+}
+
+// The callback is handed over by reference: it is too large to be held in one without an allocation.
+void CopyQualifiers(ICIMNamedElement const& from, boost::weak_ptr<ICIMNamespace> const& destination,
+                    boost::shared_ptr<ICIMNamedElement> const& to) {
+  TCopyQualifier copyQualifier(destination, to);
+  from.EnumerateQualifiers(boost::ref(copyQualifier), TCIMContext());
+}
+
+// A declaration without a default may leave the type to be told by the declaration itself.
+TCIMValue TypedDefault(TCIMValue::TCIMType type, TCIMValue defaultValue) {
+  if (defaultValue.GetType() == TCIMValue::TCIMType::kCIMTypeInvalid) defaultValue.SetNullValue(type, 0);
+  return defaultValue;
+}
+
+bool HasProductInstances(ICIMClass const& cls) {
+  const boost::shared_ptr<ICIMQualifier> pluginName = cls.GetQualifier(kPluginNameQualifier, TCIMContext());
+  const bool isAbstract = cls.IsAbstract(TCIMContext());
+  return !isAbstract && !pluginName && cls.GetName(TCIMContext()) == kProductClassName;
+}
+
+bool IsProduct(ICIMInstance const& instance) {
+  return instance.GetClass(TCIMContext())->GetName(TCIMContext()) == kProductClassName;
+}
+
+}  // namespace
+
+// ---- Qualifier declarations ----
+
+TCopyQualifierDecls::TCopyQualifierDecls(boost::weak_ptr<ICIMNamespace> destination) : fDestination(destination) {}
+
+bool TCopyQualifierDecls::operator()(boost::shared_ptr<ICIMQualifierDecl> declaration) {
+  const TCIMContext none;
+  const std::string name = declaration->GetName(none);
+  const TCIMValue defaultValue = TypedDefault(declaration->GetType(none), declaration->GetDefaultValue(none));
+  const unsigned int scope = declaration->GetScope(none);
+  const unsigned int flavor = declaration->GetFlavor(none);
+  Lock(fDestination)->CreateQualifierDecl(name, defaultValue, scope, flavor, none);
+  return true;
+}
+
+// ---- Classes ----
+
+TCopyClassTree::TCopyClassTree(boost::weak_ptr<ICIMNamespace> destination, bool pass, bool noProductInstances)
+    : fDestination(destination), fPass(pass), fNoProductInstances(noProductInstances) {}
+
+bool TCopyClassTree::operator()(boost::shared_ptr<ICIMClass> cls) {
+  TCopyClass copyClass(Lock(fDestination), fPass, fNoProductInstances);
+  copyClass(cls);
+  cls->EnumerateSubClasses(copyClass, TCIMContext());
+  return true;
+}
+
+TCopyClass::TCopyClass(boost::weak_ptr<ICIMNamespace> destination, bool pass, bool noProductInstances)
+    : fDestination(destination), fPass(pass), fNoProductInstances(noProductInstances) {}
+
+bool TCopyClass::operator()(boost::shared_ptr<ICIMClass> cls) {
+  if (cls->GetClassFlag(TCIMContext()) != fPass) return true;
+  TCIMCopy::CopyClass(cls, Lock(fDestination));
+  if (!HasProductInstances(*cls)) return true;
+
+  std::vector<boost::shared_ptr<ICIMInstance>> instances;
+  cls->EnumerateInstances(TAddToVectorCallback<ICIMInstance>(instances), TCIMContext());
+  for (auto const& instance : instances)
+    if (IsProduct(*instance) && !fNoProductInstances) TCIMCopy::CopyInstance(instance, Lock(fDestination));
+  return true;
+}
+
+// ---- What belongs to a class ----
+
+TCopyQualifier::TCopyQualifier(boost::weak_ptr<ICIMNamespace> destination, boost::shared_ptr<ICIMNamedElement> target)
+    : fDestination(destination), fTarget(target) {}
+
+bool TCopyQualifier::operator()(boost::shared_ptr<ICIMQualifier> qualifier) {
+  const TCIMContext none;
+  const boost::shared_ptr<ICIMQualifierDecl> declaration = Lock(fDestination)->GetQualifierDecl(qualifier->GetName(none), none);
+  if (!declaration) throw TZEPException(kZEPStatusNotFound);
+  fTarget->AddQualifier(declaration, qualifier->GetValue(none), qualifier->GetFlavor(none), none);
+  return true;
+}
+
+TCopyPropertyDecl::TCopyPropertyDecl(boost::weak_ptr<ICIMNamespace> destination, boost::shared_ptr<ICIMClass> target)
+    : fDestination(destination), fTarget(target) {}
+
+bool TCopyPropertyDecl::operator()(boost::shared_ptr<ICIMPropertyDecl> declaration) {
+  try {
+    Copy(*declaration);
+  } catch (TZEPException const&) {
+    LogDebug("TCopyPropertyDecl::operator() - Get an Exception");
+  }
+  return true;
+}
+
+void TCopyPropertyDecl::Copy(ICIMPropertyDecl const& declaration) {
+  const TCIMContext none;
+  const std::string name = declaration.GetName(none);
+  // What these two find changes nothing, but a declaration for which one of them throws is left out. Kept.
+  fTarget->GetPropertyDecl(name, none);
+  declaration.GetQualifier(kOverrideQualifier, none);
+
+  const TCIMValue defaultValue = TCIMCopy::CopyValue(declaration.GetDefaultValue(none), Lock(fDestination));
+  const boost::shared_ptr<ICIMPropertyDecl> copy = fTarget->AddPropertyDecl(name, defaultValue, none);
+  CopyQualifiers(declaration, fDestination, copy);
+}
+
+TCopyStaticProperty::TCopyStaticProperty(boost::weak_ptr<ICIMNamespace> destination, boost::shared_ptr<ICIMClass> target)
+    : fDestination(destination), fTarget(target) {}
+
+bool TCopyStaticProperty::operator()(boost::shared_ptr<ICIMProperty> property) {
+  const TCIMContext none;
+  const TCIMValue value = TCIMCopy::CopyValue(property->GetValue(none), Lock(fDestination));
+  fTarget->SetStaticProperty(property->GetDeclaration(none)->GetName(none), value, none);
+  return true;
+}
+
+TCopyMethodDecl::TCopyMethodDecl(boost::weak_ptr<ICIMNamespace> destination, boost::shared_ptr<ICIMClass> target)
+    : fDestination(destination), fTarget(target) {}
+
+bool TCopyMethodDecl::operator()(boost::shared_ptr<ICIMMethodDecl> declaration) {
+  const TCIMContext none;
+  const boost::shared_ptr<ICIMMethodDecl> copy =
+      fTarget->AddMethodDecl(declaration->GetName(none), declaration->GetReturnType(none), none);
+  CopyQualifiers(*declaration, fDestination, copy);
+  TCopyParameterDecl copyParameter(fDestination, copy);
+  declaration->EnumerateParameterDecls(boost::ref(copyParameter), none);
+  return true;
+}
+
+TCopyParameterDecl::TCopyParameterDecl(boost::weak_ptr<ICIMNamespace> destination, boost::shared_ptr<ICIMMethodDecl> target)
+    : fDestination(destination), fTarget(target) {}
+
+bool TCopyParameterDecl::operator()(boost::shared_ptr<ICIMParameterDecl> declaration) {
+  const TCIMContext none;
+  const boost::shared_ptr<ICIMParameterDecl> copy =
+      fTarget->AddParameterDecl(declaration->GetName(none), declaration->GetType(none), declaration->GetMaxArraySize(none),
+                                declaration->GetReferencedClassName(none), none);
+  CopyQualifiers(*declaration, fDestination, copy);
+  return true;
+}
+
+// ---- What belongs to an instance or a reference ----
+
+TCopyInstanceProperty::TCopyInstanceProperty(boost::weak_ptr<ICIMNamespace> destination, boost::shared_ptr<ICIMInstance> target)
+    : fDestination(destination), fTarget(target) {}
+
+bool TCopyInstanceProperty::operator()(boost::shared_ptr<ICIMProperty> property) {
+  const TCIMContext none;
+  const TCIMValue value = property->GetValue(none);
+  if (value.IsNull()) return true;
+  const boost::shared_ptr<ICIMProperty> copy = fTarget->GetProperty(property->GetName(none), none);
+  if (!copy) throw TZEPException(kZEPStatusNotFound);
+  copy->SetValue(TCIMCopy::CopyValue(value, Lock(fDestination)), none);
+  return true;
+}
+
+TCopyReferenceKeys::TCopyReferenceKeys(boost::weak_ptr<ICIMNamespace> destination, TCIMReference& target)
+    : fDestination(destination), fTarget(target) {}
+
+bool TCopyReferenceKeys::operator()(std::pair<std::string, TCIMValue> binding) {
+  fTarget.AddKeyValue(binding.first, TCIMCopy::CopyValue(binding.second, Lock(fDestination)));
+  return true;
+}

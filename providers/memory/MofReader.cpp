@@ -1,0 +1,21 @@
+#include "Mof.h"
+#include "TMofBuilder.h"
+#include "TMofParser.h"
+
+namespace NQRVZEP20 {
+
+void ReadMofFile(std::string const& path, boost::shared_ptr<ICIMNamespace> ns) {
+  TMofDocument document;
+  TMofSources sources(document);
+  TMofParser(document, sources, sources.OpenFirst(path)).Parse();
+  TMofBuilder(document, ns).Build();
+}
+
+void ReadMofText(std::string const& text, std::string const& name, boost::shared_ptr<ICIMNamespace> ns) {
+  TMofDocument document;
+  TMofSources sources(document);
+  TMofParser(document, sources, sources.OpenText(text, name)).Parse();
+  TMofBuilder(document, ns).Build();
+}
+
+}  // namespace NQRVZEP20

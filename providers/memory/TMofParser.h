@@ -1,0 +1,60 @@
+#pragma once
+
+#include "MofTree.h"
+#include "TMofLexer.h"
+#include "TMofSources.h"
+
+#include <string>
+#include <string_view>
+
+namespace NQRVZEP20 {
+
+// Reads one file, and those that it includes, into a document: its form only, not whether it makes sense. Throws TMofError,
+// which tells what was expected.
+class TMofParser {
+public:
+  TMofParser(TMofDocument& document, TMofSources& sources, TMofFile const& file);
+
+  void Parse();
+
+private:
+  // ---- Productions ----
+  void ParsePragma();
+  void ParseQualifierDecl();
+  void ParseClassOrInstance();
+  void ParseClass(TMofQualifiers qualifiers);
+  void ParseInstance();
+  TMofQualifiers ParseQualifiers();
+  TMofQualifier ParseQualifier();
+  unsigned int ParseScope();
+  unsigned int ParseFlavor(bool inDeclaration);
+  TMofFeature ParseFeature();
+  TMofParameter ParseParameter();
+  TMofType ParseType();
+  TMofType ParseIntrinsicType();
+  void ParseArrayMark(TMofType& type);
+  TMofPlace ParseAlias();
+  TMofValue ParseValue();
+  TMofValue ParseArray();
+  TMofLiteral ParseLiteral();
+  std::string ParseString();
+
+  // ---- Tokens ----
+  TMofPlace Here() const { return {&fFile, fToken.fText}; }
+  void Advance() { fToken = fLexer.Next(); }
+  bool IsMark(char mark) const { return fToken.fKind == TMofToken::kMark && fToken.fText.front() == mark; }
+  bool IsWord(std::string_view word) const;
+  bool Skip(char mark);  // goes on if that mark stands here
+  bool SkipWord(std::string_view word);
+  void Expect(char mark);
+  TMofPlace ExpectName(char const* what);
+  [[noreturn]] void Refuse(std::string const& expected) const;
+
+  TMofDocument& fDocument;
+  TMofSources& fSources;
+  TMofFile const& fFile;
+  TMofLexer fLexer;
+  TMofToken fToken;  // the next one
+};
+
+}  // namespace NQRVZEP20

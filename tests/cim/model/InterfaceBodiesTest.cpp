@@ -1,0 +1,78 @@
+// What a plug-in may leave out of an implementation of the interfaces.
+
+#include "Fakes.h"
+#include "ICIMParameterDecl.h"
+#include "ICIMQualifierDecl.h"
+#include "tests/Support.h"
+
+namespace NQRVZEP20 {
+namespace {
+
+// The declarations and the qualifier of a plug-in that writes nothing but what it has to.
+template <class TInterface>
+class TBareElement : public TInterface {
+public:
+  std::string GetName(TCIMContext const&) const override { return "Bare"; }
+  boost::shared_ptr<ICIMQualifier> GetQualifier(std::string const&, TCIMContext const&) const override { return {}; }
+  void EnumerateQualifiers(boost::function<bool(boost::shared_ptr<ICIMQualifier>)>, TCIMContext const&) const override {}
+  boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl>, TCIMValue const&, unsigned int,
+                                                TCIMContext const&) override {
+    Refuse();
+  }
+};
+
+class TBareMethodDecl : public TBareElement<ICIMMethodDecl> {
+public:
+  TCIMValue::TCIMType GetReturnType(TCIMContext const&) const override { return ECIMType::kCIMTypeUint32; }
+  boost::shared_ptr<ICIMParameterDecl> AddParameterDecl(std::string const&, TCIMValue::TCIMType, unsigned int, std::string const&,
+                                                        TCIMContext const&) override {
+    Refuse();
+  }
+  void EnumerateParameterDecls(boost::function<bool(boost::shared_ptr<ICIMParameterDecl>)>, TCIMContext const&) const override {}
+};
+
+class TBareParameterDecl : public TBareElement<ICIMParameterDecl> {
+public:
+  TCIMValue::TCIMType GetType(TCIMContext const&) const override { return ECIMType::kCIMTypeUint32; }
+  unsigned int GetMaxArraySize(TCIMContext const&) const override { return 0; }
+  std::string GetReferencedClassName(TCIMContext const&) const override { return ""; }
+};
+
+class TBareQualifier : public ICIMQualifier {
+public:
+  std::string GetName(TCIMContext const&) const override { return "Bare"; }
+  TCIMValue GetValue(TCIMContext const&) const override { return TCIMValue(true); }
+  unsigned int GetFlavor(TCIMContext const&) const override { return 0; }
+};
+
+TEST(InterfaceBodiesTest, WhatNeedsAnAnswerIsNotImplemented) {
+  const TCIMContext none;
+  const auto ns = boost::make_shared<TFakeNamespace>();
+  const TFakeInstance instance;
+  const TFakePropertyDecl property("Id", ECIMType::kCIMTypeUint32, TCIMValue(1u));
+  EXPECT_STATUS(ns->GetName(none), kZEPStatusNotImplemented);
+  EXPECT_STATUS(ns->CreateQualifierDecl("Key", TCIMValue(false), 0, 0, none), kZEPStatusNotImplemented);
+  EXPECT_STATUS(instance.GetPath(none), kZEPStatusNotImplemented);
+  EXPECT_STATUS(property.IsKey(none), kZEPStatusNotImplemented);
+  EXPECT_STATUS(TBareQualifier().GetDeclaration(none), kZEPStatusNotImplemented);
+}
+
+TEST(InterfaceBodiesTest, BackPointersAreEmpty) {
+  const TCIMContext none;
+  EXPECT_FALSE(TFakePropertyDecl("Id", ECIMType::kCIMTypeUint32, TCIMValue(1u)).GetOwner(none).lock());
+  EXPECT_FALSE(TBareMethodDecl().GetOwner(none).lock());
+  EXPECT_FALSE(TBareParameterDecl().GetMethod(none).lock());
+  EXPECT_FALSE(TBareQualifier().GetOwner(none).lock());
+}
+
+TEST(InterfaceBodiesTest, BeginAndEndOfDeclarationsDoNothing) {
+  const TCIMContext none;
+  const auto ns = boost::make_shared<TFakeNamespace>();
+  ICIMClass& cls = ns->Add("X_Disk");
+  EXPECT_NO_THROW(cls.BeginDeclarations(none));
+  EXPECT_STATUS(cls.GetPropertyDecl("Id", none), kZEPStatusNotFound);
+  EXPECT_NO_THROW(cls.EndDeclarations(none));
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,115 @@
+// zep mof: loads and checks a schema.
+
+#include "ClassTree.h"
+#include "Commands.h"
+#include "ExitStatus.h"
+#include "ICIMClass.h"
+#include "ICIMMethodDecl.h"
+#include "ICIMPropertyDecl.h"
+#include "Json.h"
+#include "MofFile.h"
+#include "Output.h"
+#include "Text.h"
+#include "providers/memory/Mof.h"
+
+#include <CLI/CLI.hpp>
+
+#include <memory>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  std::string fFile;
+  bool fPrint = false;
+  bool fAsJson = false;
+};
+
+struct TCount {
+  char const* fKey;    // for programs
+  char const* fLabel;  // for people
+  std::size_t fCount = 0;
+};
+
+// How much of each kind of thing a namespace has.
+class TCensus {
+public:
+  explicit TCensus(ICIMNamespace const& ns) {
+    ns.EnumerateQualifierDecls([&](auto const&) { return ++fQualifierDecls.fCount, true; }, TCIMContext());
+    for (TClassEntry const& entry : ClassesOf(ns)) CountClass(entry);
+    ns.EnumerateClasses(
+        [&](boost::shared_ptr<ICIMClass> root) {
+          root->EnumerateInstances([&](auto const&) { return ++fInstances.fCount, true; }, TCIMContext());
+          return true;
+        },
+        TCIMContext());
+  }
+
+  std::vector<TCount> Counts() const {
+    return {fQualifierDecls, fClasses, fAssociations, fIndications, fAbstract, fProperties, fMethods, fParameters, fInstances};
+  }
+
+private:
+  void CountClass(TClassEntry const& entry) {
+    ++fClasses.fCount;
+    fAssociations.fCount += entry.fIsAssociation;
+    fIndications.fCount += entry.fIsIndication;
+    fAbstract.fCount += entry.fIsAbstract;
+    entry.fClass->EnumeratePropertyDecls([&](auto const&) { return ++fProperties.fCount, true; }, TCIMContext());
+    entry.fClass->EnumerateMethodDecls(
+        [&](boost::shared_ptr<ICIMMethodDecl> method) {
+          ++fMethods.fCount;
+          method->EnumerateParameterDecls([&](auto const&) { return ++fParameters.fCount, true; }, TCIMContext());
+          return true;
+        },
+        TCIMContext());
+  }
+
+  TCount fQualifierDecls{"qualifierDeclarations", "Qualifier declarations"};
+  TCount fClasses{"classes", "Classes"};
+  TCount fAssociations{"associations", "  associations"};
+  TCount fIndications{"indications", "  indications"};
+  TCount fAbstract{"abstractClasses", "  abstract"};
+  TCount fProperties{"properties", "Properties"};
+  TCount fMethods{"methods", "Methods"};
+  TCount fParameters{"parameters", "  parameters"};
+  TCount fInstances{"instances", "Instances"};
+};
+
+std::string AsText(std::string const& file, TCensus const& census) {
+  TTable table({24, 10});
+  for (TCount const& count : census.Counts()) table.Add({count.fLabel, std::to_string(count.fCount)});
+  return Printable(file) + "\n\n" + table.GetText();
+}
+
+std::string AsJson(std::string const& file, TCensus const& census) {
+  TJson document = DocumentHead("zep mof");
+  document["file"] = file;
+  for (TCount const& count : census.Counts()) document[count.fKey] = count.fCount;
+  return zep::AsText(document);
+}
+
+int Mof(TArguments const& arguments) {
+  TNamespaceView const view = ViewOfMof(arguments.fFile);
+  if (arguments.fPrint)
+    WriteOutput(WriteMof(*view.Get()));
+  else {
+    TCensus const census(*view.Get());
+    WriteOutput(arguments.fAsJson ? AsJson(arguments.fFile, census) : AsText(arguments.fFile, census));
+  }
+  return kExitComplete;
+}
+
+}  // namespace
+
+TRun AddMofArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  command.add_option("file", arguments->fFile, "The MOF file; what it includes lies in its folder or below")->required();
+  auto* const print = command.add_flag("--print", arguments->fPrint, "Write everything that was read as one MOF text");
+  command.add_flag("--json", arguments->fAsJson, "Print one JSON document")->excludes(print);
+  command.footer("Exit status: 0 when the schema is right, 1 when it is not, 64 for wrong usage.");
+  return [arguments] { return Mof(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep
