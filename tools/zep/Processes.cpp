@@ -139,8 +139,14 @@ void RunInProcesses(std::size_t count, TProcessLimits const& limits, std::functi
                     std::function<void(TProcessResult const&)> const& done) {
   std::vector<TProcess> running;
   for (std::size_t next = 0; next < count || !running.empty();) {
-    while (next < count && running.size() < limits.fParallel)
-      running.emplace_back(next++, TClock::now() + std::chrono::seconds(limits.fTimeoutSeconds), work);
+    while (next < count && running.size() < limits.fParallel) try {
+        running.emplace_back(next, TClock::now() + std::chrono::seconds(limits.fTimeoutSeconds), work);
+        ++next;
+      } catch (std::system_error const&) {
+        if (!running.empty()) break;  // there may be room again when one of them has ended
+        done({next++, false, false, {}});
+      }
+    if (running.empty()) continue;
 
     std::vector<pollfd> const polled = WaitForAny(running);
     std::vector<TProcess> stillRunning;

@@ -20,8 +20,8 @@ struct TProcessLimits {
 };
 
 // Runs `work` for the items 0 to `count` - 1, each in a process of its own, and hands each result to `done` as soon as it is
-// there. The text that `work` returns is the output. Whatever becomes of a process, the rest go on. The caller has one
-// thread. Throws std::system_error when no process can be made.
+// there. The text that `work` returns is the output. Whatever becomes of a process, the rest go on; an item for which none
+// can be made, though no other runs, is not complete. The caller has one thread.
 void RunInProcesses(std::size_t count, TProcessLimits const& limits, std::function<std::string(std::size_t)> const& work,
                     std::function<void(TProcessResult const&)> const& done);
 

@@ -4,6 +4,7 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -67,6 +68,38 @@ TEST(ProcessesTest, AFailureStopsNoneOfTheOthers) {
   EXPECT_FALSE(results.at(2).fIsComplete);
   EXPECT_EQ(results.at(3).fOutput, "");
   EXPECT_EQ(results.at(4).fOutput, "done");
+}
+
+// While it lives, so many more descriptors can be opened.
+class TDescriptorsLeft {
+public:
+  explicit TDescriptorsLeft(rlim_t count) {
+    int const next = ::dup(STDIN_FILENO);
+    ::close(next);
+    ::getrlimit(RLIMIT_NOFILE, &fBefore);
+    rlimit const few{static_cast<rlim_t>(next) + count, fBefore.rlim_max};
+    ::setrlimit(RLIMIT_NOFILE, &few);
+  }
+  ~TDescriptorsLeft() { ::setrlimit(RLIMIT_NOFILE, &fBefore); }
+  TDescriptorsLeft(TDescriptorsLeft const&) = delete;
+  TDescriptorsLeft& operator=(TDescriptorsLeft const&) = delete;
+
+private:
+  rlimit fBefore{};
+};
+
+TEST(ProcessesTest, WhereNoFurtherOneCanBeMadeItWaitsForOneToEnd) {
+  TDescriptorsLeft const left(4);
+  auto const results = ResultsOf(10, {10, 60}, [](std::size_t item) { return "item " + std::to_string(item); });
+  ASSERT_EQ(results.size(), 10u);
+  for (auto const& [item, result] : results) EXPECT_EQ(result.fOutput, "item " + std::to_string(item));
+}
+
+TEST(ProcessesTest, WhereNoneCanBeMadeEveryItemIsTold) {
+  TDescriptorsLeft const left(1);
+  auto const results = ResultsOf(10, {10, 60}, [](std::size_t) { return "done"; });
+  ASSERT_EQ(results.size(), 10u);
+  for (auto const& [item, result] : results) EXPECT_FALSE(result.fIsComplete) << item;
 }
 
 TEST(ProcessesTest, OneWhoseTimeIsUpIsEnded) {
