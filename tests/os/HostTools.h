@@ -3,6 +3,7 @@
 // What the tests of the host services share.
 
 #include "TOSSpecific.h"
+#include "tests/LogOf.h"
 #include "tests/Support.h"
 
 #include <grp.h>
@@ -18,18 +19,6 @@ namespace NQRVZEP20 {
 
 // The path of a program of tests/os/children.
 inline std::string Child(std::string const& name) { return std::string(ZEP_CHILDREN_DIR) + "/" + name; }
-
-// Everything that the function logs, on a thread of its own: "[Debug] SpawnProcess: process ls".
-template <class TFunction>
-std::vector<std::string> LogOf(TFunction function) {
-  std::vector<std::string> entries;
-  OnNewThread([&] {
-    TLogCapture const log;
-    function();
-    entries = log.Entries();
-  });
-  return entries;
-}
 
 // Works in another directory, and in the old one again at the end.
 class TWorkingDirectory {

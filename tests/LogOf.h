@@ -1,0 +1,19 @@
+#pragma once
+
+#include "tests/Support.h"
+
+namespace NQRVZEP20 {
+
+// Everything that the function logs, on a thread of its own: "[Debug] SpawnProcess: process ls".
+template <class TFunction>
+std::vector<std::string> LogOf(TFunction function) {
+  std::vector<std::string> entries;
+  OnNewThread([&] {
+    TLogCapture const log;
+    function();
+    entries = log.Entries();
+  });
+  return entries;
+}
+
+}  // namespace NQRVZEP20
