@@ -296,9 +296,9 @@ public:
   // The identity of a remote server, read from the FRU data of its management controller over IPMI on the LAN (port 623)
   // through the platform library libipmiClient.so. Each call opens a session of its own, in place of the one that was
   // open, and leaves it open. Empty when no session could be opened, "N/A" when the controller could not be asked. Not
-  // from two threads at once.
-  static std::string GetRemoteMSN(std::string host, std::string user, std::string password);  // serial number, 7 characters
-  static std::string GetRemoteMT(std::string host, std::string user, std::string password);   // machine type, 4 characters
+  // from two threads at once. Serial number and type always have 7 and 4 characters; where the answer was shorter, zeros.
+  static std::string GetRemoteMSN(std::string host, std::string user, std::string password);
+  static std::string GetRemoteMT(std::string host, std::string user, std::string password);
   static std::string GetRemoteMachineModel(std::string host, std::string user, std::string password);
 
   // Marks the start of a debug session: makes or truncates the file "<path><machine type><local time>.log", such as

@@ -164,11 +164,9 @@ std::optional<TIpmiResponse> ReadFruData(unsigned offset) {
 // The response as text: byte 0 is the count, the data follow.
 std::string_view TextOf(TIpmiResponse const& response) { return reinterpret_cast<char const*>(response.data()); }
 
-// `count` characters of the response from `place` on. Zeros at the end, where a short answer has nothing, are none of them.
+// `count` characters of the response from `place` on, also when the answer is shorter and zeros stand there.
 std::string CharactersOf(TIpmiResponse const& response, std::size_t place, std::size_t count) {
-  const std::string_view all(reinterpret_cast<char const*>(response.data()), response.size());
-  const std::string_view characters = all.substr(place, count);
-  return std::string(characters.substr(0, characters.find_last_not_of('\0') + 1));
+  return std::string(reinterpret_cast<char const*>(response.data()) + place, count);
 }
 
 struct TAccess {

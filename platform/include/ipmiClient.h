@@ -6,7 +6,8 @@
  * CloseConnection and never links it.
  *
  * It holds at most one session, which belongs to the whole process: use it from one thread at a time. Every call blocks
- * until the controller has answered or has been silent for about 5 s.
+ * until the controller has answered or has been silent for about 5 s; a command may then take as long again to open the
+ * session anew, for a controller that has forgotten it is as silent.
  */
 
 #ifdef __cplusplus

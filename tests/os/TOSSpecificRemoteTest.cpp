@@ -38,6 +38,8 @@ std::string Sent(TOperation const& operation) {
 // An answer as a controller gives it: the count, then 30 bytes of FRU data.
 std::string Answer(std::string const& text) { return "\x1E" + text + "\0"s + std::string(29 - text.size(), ' '); }
 
+std::string UpToZero(std::string const& text) { return text.substr(0, text.find('\0')); }
+
 class RemoteIdentityTest : public testing::Test {
 protected:
   // Calls the operation with the answer given.
@@ -86,10 +88,8 @@ TEST_F(RemoteIdentityTest, TheResultIsCutOutOfTheResponse) {
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);
-    std::string serialNumber = ResultOf(TOSSpecific::GetRemoteMSN, row.answer);
-    serialNumber.resize(std::min(serialNumber.size(), serialNumber.find('\0')));  // what lies behind it is the next test's
-    EXPECT_EQ(serialNumber, row.serialNumber);
-    EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMT, row.answer), row.type);
+    EXPECT_EQ(UpToZero(ResultOf(TOSSpecific::GetRemoteMSN, row.answer)), row.serialNumber);
+    EXPECT_EQ(UpToZero(ResultOf(TOSSpecific::GetRemoteMT, row.answer)), row.type);
     EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMachineModel, row.answer), row.model);
   }
 }
@@ -108,8 +108,9 @@ TEST_F(RemoteIdentityTest, SerialNumberAndTypeHaveTheirLengthAlsoAroundAZeroByte
   EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMSN,
                      "\x1E"
                      "AB\0\0\0\0\0hi"s),
-            "AB")
-      << "zeros at the end are none of it";
+            "AB\0\0\0\0\0"s);
+  EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMSN, "\x02xy"), "xy\0\0\0\0\0"s);
+  EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMT, ""), std::string(4, '\0'));
 }
 
 TEST_F(RemoteIdentityTest, TheWholeBufferMayBeFilled) {

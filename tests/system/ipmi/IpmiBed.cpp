@@ -42,7 +42,9 @@ std::string Receive(int fd, sockaddr_in* from) {
 
 }  // namespace
 
-bool HasIpmiBed() { return ::geteuid() == 0 && IsOnPath("ipmi_sim"); }
+bool HasIpmiBed() { return IsOnPath("ipmi_sim") && CanMakeNetworks(); }
+
+bool CanMakeNetworks() { return ::geteuid() == 0 && IsOnPath("ip") && std::system("unshare --net true >/dev/null 2>&1") == 0; }
 
 void EnterNetworkNamespace() {
   if (::unshare(CLONE_NEWNET) != 0) throw std::runtime_error("no network namespace");
@@ -61,8 +63,9 @@ TSimulator::TSimulator(TSettings const& settings) {
   fOutput.reset(ends[0]);
   TUniqueFd const output(ends[1]);
   std::string const port = std::to_string(settings.port);
-  std::vector<char const*> arguments = {ZEP_IPMI_SIM_START,     "--addr",   settings.address.c_str(),     "--model",
-                                        settings.model.c_str(), "--serial", settings.serialNumber.c_str()};
+  std::vector<char const*> arguments = {ZEP_IPMI_SIM_START,       "--addr",   settings.address.c_str(),      "--model",
+                                        settings.model.c_str(),   "--serial", settings.serialNumber.c_str(), "--password",
+                                        settings.password.c_str()};
   if (!settings.fru.empty()) arguments.insert(arguments.end(), {"--fru", settings.fru.c_str()});
   arguments.insert(arguments.end(), {port.c_str(), nullptr});
   fScript = ::fork();
@@ -120,11 +123,11 @@ void TUdpPeer::Run() {
 std::optional<std::string> AskOf(int port, std::string const& datagram) {
   // One source address for all that is asked, as a session has.
   static TUniqueFd const socket(::socket(AF_INET, SOCK_DGRAM, 0));
+  while (IsReadable(socket.get(), 0)) Receive(socket.get(), nullptr);  // an answer that came too late
   sockaddr_in const address = Loopback(port);
   ::sendto(socket.get(), datagram.data(), datagram.size(), 0, reinterpret_cast<sockaddr const*>(&address), sizeof address);
   if (!IsReadable(socket.get(), 300)) return std::nullopt;
-  sockaddr_in from{};
-  return Receive(socket.get(), &from);
+  return Receive(socket.get(), nullptr);
 }
 
 // ---- The platform library ----

@@ -15,14 +15,14 @@ namespace NQRVZEP20 {
 // Whether the simulator is installed and this user may make network namespaces. A test that needs more than loopback's high
 // ports calls EnterNetworkNamespace first.
 bool HasIpmiBed();
-inline constexpr char const* kIpmiBedNeeds = "ipmi_sim (package openipmi), and root";
+bool CanMakeNetworks();  // iproute2, and the right to make network namespaces
+inline constexpr char const* kIpmiBedNeeds = "ipmi_sim (package openipmi), ip (package iproute2), and root";
 
 // Moves the calling thread, and the processes that it starts, into a network of its own in which only loopback is up. For
 // the rest of the process.
 void EnterNetworkNamespace();
 
-// A simulated controller; ended with the object. Its account is zepadmin with the password zeppass1, its FRU data holds the
-// given texts.
+// A simulated controller; ended with the object. Its account is zepadmin, its FRU data holds the given texts.
 class TSimulator {
 public:
   struct TSettings {
@@ -30,6 +30,7 @@ public:
     int port = 623;
     std::string model = "1234AB7";
     std::string serialNumber = "KQ12345";
+    std::string password = "zeppass1";
     std::string fru = {};  // a whole FRU image instead of the two
   };
 

@@ -2,9 +2,14 @@
 
 #include "tests/system/ipmi/IpmiBed.h"
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
+#include <sys/prctl.h>
+#include <sys/wait.h>
 
 #include <chrono>
+#include <csignal>
+#include <list>
 #include <random>
 
 namespace NQRVZEP20 {
@@ -162,6 +167,46 @@ TEST_F(IpmiClientTest, OpeningClosesTheSessionBefore) {
   for (int round = 0; round < 70; ++round) ASSERT_EQ(client_.Open(623), kIpmiClientOk) << round;
   EXPECT_EQ(client_.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "wrong"), kIpmiClientWrongPassword);
   EXPECT_EQ(client_.ReadFru(0, 1).result, kIpmiClientNoSession) << "also when opening fails";
+}
+
+// A process that holds a session until the object ends.
+class TSessionHolder {
+public:
+  explicit TSessionHolder(TIpmiClientLibrary const& client) {
+    int ends[2];
+    if (::pipe2(ends, O_CLOEXEC) != 0) throw std::runtime_error("no pipe");
+    TUniqueFd const status(ends[0]), told(ends[1]);
+    fProcess = ::fork();
+    if (fProcess == 0) {
+      ::prctl(PR_SET_PDEATHSIG, SIGKILL);
+      char const result = static_cast<char>(client.Open(623));
+      (void)!::write(told.get(), &result, 1);
+      ::pause();
+      ::_exit(0);
+    }
+    char result = -1;
+    (void)!::read(status.get(), &result, 1);
+    fResult = result;
+  }
+  ~TSessionHolder() {
+    ::kill(fProcess, SIGKILL);
+    ::waitpid(fProcess, nullptr, 0);
+  }
+  TSessionHolder(TSessionHolder const&) = delete;
+
+  int Result() const { return fResult; }
+
+private:
+  pid_t fProcess;
+  int fResult;
+};
+
+TEST_F(IpmiClientTest, AControllerWithoutASessionLeftIsBusy) {
+  Start();
+  constexpr int kRoom = 63;
+  std::list<TSessionHolder> holders;
+  for (int n = 0; n < kRoom; ++n) ASSERT_EQ(holders.emplace_back(client_).Result(), kIpmiClientOk) << n;
+  EXPECT_EQ(client_.Open(623), kIpmiClientBusy);
 }
 
 TEST_F(IpmiClientTest, ClosingEndsTheSession) {

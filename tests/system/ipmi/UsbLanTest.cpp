@@ -29,7 +29,7 @@ void RunShell(std::string const& command) { ASSERT_EQ(std::system(command.c_str(
 class UsbLanTest : public testing::Test {
 protected:
   void SetUp() override {
-    NEEDS(::geteuid() == 0 && std::system("command -v ip >/dev/null") == 0, "ip (package iproute2), and root");
+    NEEDS(CanMakeNetworks(), "ip (package iproute2), and root");
     EnterNetworkNamespace();
     library_.reset(::dlopen(ZEP_BUILD_DIR "/lib/ovdusblan.so", RTLD_LAZY));
     ASSERT_TRUE(library_) << ::dlerror();
