@@ -39,7 +39,7 @@ read -ra flags <<<"$(pkg-config --define-variable=prefix="$work/prefix" --cflags
 check "the consumer built with pkg-config" "$work/consumer"
 
 # A provider plug-in of somebody else's, as docs/writing-a-provider.md builds it.
-cmake -S "$here/../../examples/Clock" -B "$work/clock" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/clock.log"
+cmake -G Ninja -S "$here/../../examples/Clock" -B "$work/clock" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/clock.log"
 cmake --build "$work/clock" >>"$work/clock.log" || { cat "$work/clock.log" >&2; exit 1; }
 cp "$work/clock/libClock.nsp.so" "$private/"
 "$work/prefix/bin/zep" report --sample >"$work/report" || true  # a machine that tells little is no failure here
