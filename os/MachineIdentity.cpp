@@ -11,10 +11,11 @@ namespace {
 unsigned char ByteAt(std::string_view bytes, std::size_t offset) { return static_cast<unsigned char>(bytes[offset]); }
 
 std::vector<std::string> SplitStringSet(std::string_view set) {
-  if (!set.empty() && set.front() == '\0') return {};  // a set without strings is two zero bytes
   std::string spared(set);
   spared.push_back('\0');  // multiStringTok takes the last string only with a byte to spare behind the set
-  return TOSSpecific::multiStringTok(spared.data(), spared.size(), '\0');
+  std::vector<std::string> strings = TOSSpecific::multiStringTok(spared.data(), spared.size(), '\0');
+  strings.erase(std::find(strings.begin(), strings.end(), ""), strings.end());  // an empty one closes the set
+  return strings;
 }
 
 // Assigns the `count` characters from `start` on, when there are as many.

@@ -45,6 +45,7 @@ void CopyInKernel(int from, int to) {
   constexpr std::size_t kAtATime = 1 << 30;
   off_t copied = 0;
   for (ssize_t got; (got = ::copy_file_range(from, nullptr, to, nullptr, kAtATime, 0)) > 0;) copied += got;
+  if (copied == 0) return;  // an end may be a pipe, in which there are no places to go to
   off_t const start = copied - copied % static_cast<off_t>(kChunkSize);
   if (::lseek(from, start, SEEK_SET) != start || ::lseek(to, start, SEEK_SET) != start)
     throw TZEPException(kZEPStatusFileSystemError);

@@ -104,6 +104,10 @@ TEST(MachineIdentityTest, DamagedStructuresNameNoString) {
       {"a string that nothing ends", "\1\6\0\0\0\1one"s, "none"},
       {"a string and one zero", "\1\6\0\0\0\1one\0"s, "none"},
       {"an empty set", "\1\6\0\0\0\1\0\0"s, "none"},
+      {"an empty set and zeros behind it", "\1\6\0\0\0\2\0\0\0\0"s, "none"},
+      {"a number behind the set, and zeros there", "\1\6\0\0\0\2one\0\0\0"s, "none"},
+      {"a number behind the set, and more zeros there", "\1\6\0\0\0\3one\0\0\0\0\0\0"s, "none"},
+      {"a number behind the set, and another text there", "\1\6\0\0\0\3one\0\0two\0\0"s, "none"},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);

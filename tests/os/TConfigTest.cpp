@@ -176,6 +176,14 @@ TEST_F(TConfigTest, InstanceReadsTheFileOnce) {
             "same, 1");
 }
 
+TEST_F(TConfigTest, InstanceIsNullUntilItsFirstUse) {
+  EXPECT_EQ(InChild([] {
+              if (TConfig::cfgInstance != nullptr) return "there already";
+              return TConfig::GetInstance() == TConfig::cfgInstance ? "made" : "another";
+            }),
+            "made");
+}
+
 TEST_F(TConfigTest, InstanceMadeWithoutAFileStaysEmpty) {
   EXPECT_EQ(InChild([] {
               TConfig::GetInstance();

@@ -407,6 +407,16 @@ TEST_F(TLoggerTest, InitializeOpensThroughADerivedLogger) {
 
 // ---- The line ----
 
+TEST_F(TLoggerTest, TheSeveritiesHaveTheirNumbers) {
+  EXPECT_EQ(ILogger::kLogError, 0);
+  EXPECT_EQ(ILogger::kLogWarning, 1);
+  EXPECT_EQ(ILogger::kLogStatus, 2);
+  EXPECT_EQ(ILogger::kLogDebug, 3);
+  EXPECT_EQ(ILogger::kLogVerbose, 4);
+  EXPECT_EQ(ILogger::kLogMemoryOnly, 100);
+  EXPECT_EQ(ILogger::kLogMemoryOnlyAlways, 101);
+}
+
 TEST_F(TLoggerTest, EverySeverityHasItsLabel) {
   struct {
     ILogger::EZEPLogSeverity severity;

@@ -153,6 +153,12 @@ TEST_F(FilesTest, PseudoFilesAndDevicesAreCopied) {
   TOSSpecific::FileCopy(fDir.Path("pipe"), fDir.Path("fromPipe"));
   writer.join();
   EXPECT_EQ(ReadFile(fDir.Path("fromPipe")), TextOf(200000));
+
+  std::string arrived;
+  std::thread reader([&] { arrived = ReadFile(fDir.Path("pipe")); });
+  EXPECT_NO_THROW(TOSSpecific::FileCopy(fDir.Path("source"), fDir.Path("pipe")));
+  reader.join();
+  EXPECT_EQ(arrived, TextOf(2000000));
 }
 
 TEST_F(FilesTest, CopyThrowsWhenAnEndCannotBeOpened) {

@@ -263,6 +263,16 @@ TEST_F(RootPathTest, PassesOverDirectoriesAndDeadLinks) {
   EXPECT_THAT(Probe("nsps"), ElementsAre("Link"));
 }
 
+TEST_F(RootPathTest, ARootThatCannotBeOpenedIsAFileSystemError) {
+  // Found by a relative name, which leads nowhere from another working directory.
+  TProgramRun const run = RunProgram("cd " + fDir.Path() + " && LD_LIBRARY_PATH=. " + kProbe + " nsps");
+  EXPECT_EQ(run.output, "");
+  fs::create_directory(fDir.Path("zep-plug-ins"));
+  fs::copy_file(kLibrary, fDir.Path("zep-plug-ins/libzepcore.so"));
+  EXPECT_EQ(RunProgram("cd " + fDir.Path() + " && LD_LIBRARY_PATH=zep-plug-ins " + kProbe + " nsps-elsewhere").output,
+            "threw kZEPStatusFileSystemError\n");
+}
+
 TEST_F(RootPathTest, TheServicesComeInTheOrderOfTheDirectory) {
   for (char const* name : {"M", "Z", "A", "Q", "B", "Y", "C", "X"})
     WriteFile(fDir.Path(std::string("lib") + name + ".nsp.so"), "");

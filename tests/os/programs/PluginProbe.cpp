@@ -1,7 +1,7 @@
 // Calls one operation on plug-ins and prints what comes of it: the results, one a line; what was thrown; what was recorded in
 // the log, with its severity. With "load-plugins", one attempt for each path.
 //
-//   PluginProbe root | nsps | nscs | services KIND | load-nsp NAME | load-nsc NAME | load-plugins PATH...
+//   PluginProbe root | nsps | nsps-elsewhere | nscs | services KIND | load-nsp NAME | load-nsc NAME | load-plugins PATH...
 
 #include "INamespaceConsumer.h"
 #include "INamespaceProvider.h"
@@ -11,6 +11,7 @@
 #include "TZEPException.h"
 
 #include <dlfcn.h>
+#include <unistd.h>
 
 #include <iostream>
 #include <memory>
@@ -53,6 +54,7 @@ void PrintThrown(std::string const& operation, std::string const& argument) {
   try {
     if (operation == "root") Print({TOSSpecific::GetZEPRootPath()});
     if (operation == "nsps") Print(TOSSpecific::FindNSPs());
+    if (operation == "nsps-elsewhere" && ::chdir("/proc") == 0) Print(TOSSpecific::FindNSPs());
     if (operation == "nscs") Print(TOSSpecific::FindNSCs());
     if (operation == "services") Print(TOSSpecific::FindNSServices(argument));
     if (operation == "load-nsp") LoadProvider(argument);
