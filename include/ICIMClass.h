@@ -10,7 +10,8 @@ class ICIMNamespace;
 class ICIMProperty;
 class ICIMPropertyDecl;
 
-// A CIM class: its name, superclass, qualifiers, property and method declarations, and its instances.
+// A CIM class: its name, superclass, qualifiers, property and method declarations, and its instances. Some operations have a
+// body, so that a plug-in may leave them out; where nothing else is said, it throws kZEPStatusNotImplemented.
 class ZEP_EXPORT ICIMClass : public ICIMNamedElement {
 public:
   ~ICIMClass() override;
@@ -21,10 +22,11 @@ public:
   // makes associations in a second pass, when every class that they refer to is there.
   virtual bool GetClassFlag(TCIMContext const& context) const = 0;
 
-  // True when this class itself carries the qualifier Abstract: it can have no instances of its own.
-  virtual bool IsAbstract(TCIMContext const& context) const = 0;
+  // True when this class itself carries the qualifier Abstract: it can have no instances of its own. Has a body, which
+  // answers false.
+  virtual bool IsAbstract(TCIMContext const& context) const;
 
-  virtual bool IsRootClass(TCIMContext const& context) const = 0;  // it has no superclass
+  virtual bool IsRootClass(TCIMContext const& context) const = 0;                            // it has no superclass
   virtual boost::shared_ptr<ICIMClass> GetSuperClass(TCIMContext const& context) const = 0;  // empty for a root class
 
   // Every class derived from this one, at any depth, but not the class itself. A class comes after its superclass;
@@ -58,8 +60,8 @@ public:
   // ---- Static properties: values that belong to the class ----
 
   // Gives a property that this class declares or inherits a value in the class itself, replacing an earlier one. Throws
-  // kZEPStatusNotFound for a name that is not declared and kZEPStatusTypeMismatch for a value of another type.
-  virtual void SetStaticProperty(std::string const& name, TCIMValue const& value, TCIMContext const& context) = 0;
+  // kZEPStatusNotFound for a name that is not declared and kZEPStatusTypeMismatch for a value of another type. Has a body.
+  virtual void SetStaticProperty(std::string const& name, TCIMValue const& value, TCIMContext const& context);
 
   // Those of this class itself, in the order in which they were first set.
   virtual void EnumerateStaticProperties(boost::function<bool(boost::shared_ptr<ICIMProperty>)> callback,
@@ -79,9 +81,9 @@ public:
   // ---- Methods ----
 
   // Throws kZEPStatusAlreadyExists when this class itself declares the method, kZEPStatusTypeMismatch for a return type
-  // without name or an array.
+  // without name or an array. Has a body.
   virtual boost::shared_ptr<ICIMMethodDecl> AddMethodDecl(std::string const& name, TCIMValue::TCIMType returnType,
-                                                          TCIMContext const& context) = 0;
+                                                          TCIMContext const& context);
 
   // The declarations of this class itself, without inherited ones, in the order in which they were added.
   virtual void EnumerateMethodDecls(boost::function<bool(boost::shared_ptr<ICIMMethodDecl>)> callback,
@@ -90,8 +92,8 @@ public:
   // Adds an instance that CreateInstance of this class has made to the class's instances. Throws
   // kZEPStatusInvalidInstance for any other instance, and kZEPStatusAlreadyExists when it is already there or another
   // instance of the class has the same keys (any number may have none, or only NULL ones). From then on its keys cannot be
-  // changed.
-  virtual void CommitInstance(boost::shared_ptr<ICIMInstance> instance, TCIMContext const& context) = 0;
+  // changed. Has a body.
+  virtual void CommitInstance(boost::shared_ptr<ICIMInstance> instance, TCIMContext const& context);
 };
 
 }  // namespace NQRVZEP20

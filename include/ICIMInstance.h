@@ -13,8 +13,8 @@ class ZEP_EXPORT ICIMInstance : public ICIMElement {
 public:
   ~ICIMInstance() override;
 
-  // The class that the instance was created in.
-  virtual boost::shared_ptr<ICIMClass> GetClass(TCIMContext const& context) const = 0;
+  // The class that the instance was created in. Has a body, which throws kZEPStatusNotImplemented, as that of GetPath does.
+  virtual boost::shared_ptr<ICIMClass> GetClass(TCIMContext const& context) const;
 
   // Empty when the class has no such property.
   virtual boost::shared_ptr<ICIMProperty> GetProperty(std::string const& name, TCIMContext const& context) const = 0;

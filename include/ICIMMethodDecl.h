@@ -17,8 +17,7 @@ public:
   // references (kZEPStatusNotReference), `maxArraySize` is 0 unless it is an array (kZEPStatusNotArray). Throws
   // kZEPStatusAlreadyExists when the method has a parameter of that name, kZEPStatusTypeMismatch for a type without name.
   virtual boost::shared_ptr<ICIMParameterDecl> AddParameterDecl(std::string const& name, TCIMValue::TCIMType type,
-                                                                unsigned int maxArraySize,
-                                                                std::string const& referencedClassName,
+                                                                unsigned int maxArraySize, std::string const& referencedClassName,
                                                                 TCIMContext const& context) = 0;
 
   // In the order in which they were added.

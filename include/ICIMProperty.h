@@ -17,8 +17,9 @@ public:
   // kZEPStatusInvalidOpSequence for a key of an instance that was committed.
   virtual void SetValue(TCIMValue const& value, TCIMContext const& context) = 0;
 
-  virtual std::string GetName(TCIMContext const& context) const = 0;  // spelled as declared
-  virtual boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(TCIMContext const& context) const = 0;
+  // Both have a body, which throws kZEPStatusNotImplemented.
+  virtual std::string GetName(TCIMContext const& context) const;  // spelled as declared
+  virtual boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(TCIMContext const& context) const;
 };
 
 }  // namespace NQRVZEP20

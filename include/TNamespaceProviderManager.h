@@ -17,10 +17,10 @@ public:
   boost::shared_ptr<INamespaceProvider> GetNamespaceProvider(std::string const& name) const override;
   void EnumerateNamespaceProviders(boost::function<bool(boost::shared_ptr<INamespaceProvider>)> callback) override;
 
+  static boost::shared_ptr<TNamespaceProviderManager> fgInstance;  // set while the library is loaded
+
 private:
   std::map<std::string, boost::shared_ptr<INamespaceProvider>> fProviders;  // by name, in byte order
-
-  static boost::shared_ptr<TNamespaceProviderManager> fgInstance;
 };
 
 }  // namespace NQRVZEP20

@@ -44,10 +44,31 @@ boost::shared_ptr<ICIMQualifierDecl> ICIMNamespace::CreateQualifierDecl(std::str
   throw TZEPException(kZEPStatusNotImplemented);
 }
 
+boost::shared_ptr<ICIMQualifier> ICIMNamedElement::AddQualifier(boost::shared_ptr<ICIMQualifierDecl>, TCIMValue const&,
+                                                                unsigned int, TCIMContext const&) {
+  throw TZEPException(kZEPStatusNotImplemented);
+}
+
+bool ICIMClass::IsAbstract(TCIMContext const&) const { return false; }
+void ICIMClass::SetStaticProperty(std::string const&, TCIMValue const&, TCIMContext const&) {
+  throw TZEPException(kZEPStatusNotImplemented);
+}
+boost::shared_ptr<ICIMMethodDecl> ICIMClass::AddMethodDecl(std::string const&, TCIMValue::TCIMType, TCIMContext const&) {
+  throw TZEPException(kZEPStatusNotImplemented);
+}
+void ICIMClass::CommitInstance(boost::shared_ptr<ICIMInstance>, TCIMContext const&) {
+  throw TZEPException(kZEPStatusNotImplemented);
+}
 void ICIMClass::BeginDeclarations(TCIMContext const&) {}
 void ICIMClass::EndDeclarations(TCIMContext const&) {}
 
+boost::shared_ptr<ICIMClass> ICIMInstance::GetClass(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
 TCIMReference ICIMInstance::GetPath(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
+
+std::string ICIMProperty::GetName(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
+boost::shared_ptr<ICIMPropertyDecl const> ICIMProperty::GetDeclaration(TCIMContext const&) const {
+  throw TZEPException(kZEPStatusNotImplemented);
+}
 
 bool ICIMPropertyDecl::IsKey(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
 boost::weak_ptr<ICIMNamedElement> ICIMPropertyDecl::GetOwner(TCIMContext const&) const { return {}; }

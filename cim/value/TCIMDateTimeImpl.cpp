@@ -5,6 +5,7 @@
 #include <climits>
 #include <cstdlib>
 #include <ctime>
+#include <functional>
 #include <string_view>
 
 namespace NQRVZEP20 {
@@ -20,9 +21,9 @@ void CheckOrThrow(bool isGood) {
 
 bool IsEpochDate(unsigned short year, unsigned short month, unsigned int day) { return year == 1970 && month == 1 && day == 1; }
 
-// mktime for a calendar record in standard time. It takes fields beyond their range and normalises them.
-std::time_t MakeTime(unsigned short year, unsigned short month, unsigned int day, unsigned short hour, int minute,
-                     unsigned short second) {
+// A calendar record in standard time. Fields beyond their range stay, for mktime and timegm to normalise.
+std::tm RecordOf(unsigned short year, unsigned short month, unsigned int day, unsigned short hour, int minute,
+                 unsigned short second) {
   std::tm record{};
   record.tm_year = year - 1900;
   record.tm_mon = month - 1;
@@ -31,7 +32,33 @@ std::time_t MakeTime(unsigned short year, unsigned short month, unsigned int day
   record.tm_min = minute;
   record.tm_sec = second;
   record.tm_isdst = 0;
-  return std::mktime(&record);
+  return record;
+}
+
+// localtime_r looks at TZ once, mktime whenever it is called.
+void LookAtZone() {
+  constexpr std::size_t kNoZone = 0;
+  static thread_local std::size_t zoneSeen = kNoZone;
+  char const* const zone = std::getenv("TZ");
+  std::size_t const hash = zone ? std::hash<std::string_view>()(zone) | 1 : kNoZone;
+  if (hash == zoneSeen) return;
+  ::tzset();
+  zoneSeen = hash;
+}
+
+// Whether such a local time has been, or will be, in standard time.
+bool IsStandardTime(std::tm record) {
+  static thread_local long gmtOffset = 0;  // seconds; of the time asked for last
+  LookAtZone();
+  std::time_t const asUTC = ::timegm(&record);
+  for (int tries = 0; tries < 2; ++tries) {
+    std::time_t const time = asUTC - gmtOffset;
+    std::tm local;
+    if (::localtime_r(&time, &local) == nullptr) return false;
+    if (local.tm_gmtoff == gmtOffset) return local.tm_isdst == 0;
+    gmtOffset = local.tm_gmtoff;
+  }
+  return false;
 }
 
 std::tm LocalTime(std::time_t time) {
@@ -116,11 +143,11 @@ bool TCIMDateTimeImpl::IsValid(unsigned short year, unsigned short month, unsign
                                unsigned short minute, unsigned short second, unsigned int, short utcOffset) {
   if (IsEpochDate(year, month, day)) return true;
 
-  // Such fields denote a time at least months after the epoch, which mktime can always convert, and slowly: it looks at
-  // the file of the zone, and searches through years in summer.
-  if (year >= 1972 && day <= INT_MAX) return true;
-
-  return MakeTime(year, month, day, hour, minute - utcOffset, second) != -1;
+  // mktime fails for a time that was skipped when the zone got another standard time. It is slow: it looks at the file of the
+  // zone, and searches through years in summer.
+  std::tm record = RecordOf(year, month, day, hour, minute - utcOffset, second);
+  bool const isLongAfterEpoch = year >= 1972 && day <= INT_MAX;
+  return (isLongAfterEpoch && IsStandardTime(record)) || std::mktime(&record) != -1;
 }
 
 void TCIMDateTimeImpl::Set(std::string const& text) {
@@ -205,7 +232,8 @@ std::string TCIMDateTimeImpl::ToUIString() const {
 // `utcOffset` is taken off the minutes: the datetime's own for the instant it denotes, 0 for its fields as they stand.
 // 1 January 1970 stands for the epoch where mktime gives -1.
 std::int64_t TCIMDateTimeImpl::SecondsOfTimestamp(int utcOffset) const {
-  std::time_t const time = MakeTime(fYear, fMonth, fDay, fHour, fMinute - utcOffset, fSecond);
+  std::tm record = RecordOf(fYear, fMonth, fDay, fHour, fMinute - utcOffset, fSecond);
+  std::time_t const time = std::mktime(&record);
   if (time != -1) return time;
   CheckOrThrow(IsEpochDate(fYear, fMonth, fDay));
   return 0;

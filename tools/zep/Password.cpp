@@ -3,11 +3,15 @@
 #include "Text.h"
 
 #include <fcntl.h>
+#include <poll.h>
+#include <signal.h>
+#include <sys/signalfd.h>
 #include <termios.h>
 #include <unistd.h>
 
 #include <cstdlib>
 #include <fstream>
+#include <optional>
 #include <stdexcept>
 
 namespace NQRVZEP20::zep {
@@ -29,56 +33,89 @@ std::string TakeOutOfTheEnvironment() {
   return password;
 }
 
-// The terminal of the process, without echo for as long as this lives.
+// While it lives, the signals that end or stop a program wait; each that came has its effect at the end.
+class TSignalsLater {
+public:
+  TSignalsLater() {
+    ::sigemptyset(&fSignals);
+    for (int const signal : {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGTSTP}) ::sigaddset(&fSignals, signal);
+    ::sigprocmask(SIG_BLOCK, &fSignals, &fBefore);
+    fFile = ::signalfd(-1, &fSignals, SFD_CLOEXEC);
+  }
+  ~TSignalsLater() {
+    ::close(fFile);
+    ::sigprocmask(SIG_SETMASK, &fBefore, nullptr);
+  }
+  TSignalsLater(TSignalsLater const&) = delete;
+  TSignalsLater& operator=(TSignalsLater const&) = delete;
+
+  int File() const { return fFile; }  // readable when one has come; below 0 when none can be had
+
+private:
+  sigset_t fSignals, fBefore;
+  int fFile;
+};
+
+// The terminal of the process, which shows nothing of what is typed as long as this lives.
 class TQuietTerminal {
 public:
-  TQuietTerminal() : fFd(::open("/dev/tty", O_RDWR | O_CLOEXEC)) {
-    if (fFd < 0 || ::tcgetattr(fFd, &fOld) != 0)
-      throw std::runtime_error("there is no terminal to ask for the password: set ZEP_BMC_PASSWORD or use --password-file");
-    termios quiet = fOld;
-    // An interrupt arrives as a character that ends the line, so that it cannot leave the terminal without echo.
-    quiet.c_lflag &= ~static_cast<tcflag_t>(ECHO | ISIG);
-    quiet.c_cc[VEOL] = fOld.c_cc[VINTR];
-    ::tcsetattr(fFd, TCSAFLUSH, &quiet);
+  explicit TQuietTerminal(std::string const& otherwise) : fFile(::open("/dev/tty", O_RDWR | O_CLOEXEC)) {
+    if (fFile < 0 || ::tcgetattr(fFile, &fSettings) != 0)
+      throw std::runtime_error("there is no terminal to ask for the password: " + otherwise);
+    termios settings = fSettings;
+    settings.c_lflag &= ~static_cast<tcflag_t>(ECHO);
+    ::tcsetattr(fFile, TCSAFLUSH, &settings);
   }
   ~TQuietTerminal() {
     Write("\n");
-    ::tcsetattr(fFd, TCSAFLUSH, &fOld);
-    ::close(fFd);
+    ::tcsetattr(fFile, TCSAFLUSH, &fSettings);
+    ::close(fFile);
   }
   TQuietTerminal(TQuietTerminal const&) = delete;
   TQuietTerminal& operator=(TQuietTerminal const&) = delete;
 
-  bool Write(std::string const& text) const { return ::write(fFd, text.data(), text.size()) >= 0; }
+  void Write(std::string const& text) const { (void)!::write(fFile, text.data(), text.size()); }
+
+  bool IsLineTypedBefore(TSignalsLater const& signals) const {
+    pollfd waiting[] = {{fFile, POLLIN, 0}, {signals.File(), POLLIN, 0}};
+    ::poll(waiting, 2, -1);
+    return waiting[1].revents == 0;
+  }
 
   std::string ReadLine() const {
     std::string line;
-    char c = 0;
-    while (::read(fFd, &c, 1) == 1 && c != '\n') {
-      if (c == static_cast<char>(fOld.c_cc[VINTR])) throw std::runtime_error("no password was given");
+    for (char c = 0; ::read(fFile, &c, 1) == 1;) {
+      if (c == '\n') return line;
       line += c;
     }
-    if (c != '\n') throw std::runtime_error("no password was given");
-    return line;
+    throw std::runtime_error("no password was given");
   }
 
 private:
-  int const fFd;
-  termios fOld;
+  int const fFile;
+  termios fSettings;
 };
 
-std::string AskAtTheTerminal(std::string const& user) {
-  TQuietTerminal const terminal;
-  terminal.Write("Password of " + Printable(user) + ": ");
-  return terminal.ReadLine();
+// Nothing when a signal came, which has its effect before this returns.
+std::optional<std::string> AskOnce(std::string const& owner, std::string const& otherwise) {
+  TSignalsLater const signals;
+  TQuietTerminal const terminal(otherwise);
+  terminal.Write("Password of " + Printable(owner) + ": ");
+  return terminal.IsLineTypedBefore(signals) ? std::optional(terminal.ReadLine()) : std::nullopt;
 }
 
 }  // namespace
 
-std::string AskForPassword(std::string const& user, std::string const& file) {
+std::string TypedPassword(std::string const& owner, std::string const& otherwise) {
+  std::optional<std::string> password;
+  while (!password) password = AskOnce(owner, otherwise);  // again when zep was stopped and goes on
+  return *password;
+}
+
+std::string ControllerPassword(std::string const& user, std::string const& file) {
   if (!file.empty()) return PasswordIn(file);
   if (std::getenv(kVariable) != nullptr) return TakeOutOfTheEnvironment();
-  return AskAtTheTerminal(user);
+  return TypedPassword(user, "set ZEP_BMC_PASSWORD or use --password-file");
 }
 
 }  // namespace NQRVZEP20::zep

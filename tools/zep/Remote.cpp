@@ -1,21 +1,15 @@
 #include "Remote.h"
 
 #include "Failure.h"
+#include "Password.h"
 #include "Text.h"
 
-#include <poll.h>
-#include <signal.h>
-#include <sys/signalfd.h>
-#include <termios.h>
 #include <unistd.h>
 
 #include <cctype>
-#include <cerrno>
 #include <cstdlib>
 #include <fstream>
-#include <iostream>
 #include <string_view>
-#include <system_error>
 
 namespace NQRVZEP20::zep {
 
@@ -152,73 +146,6 @@ TLogin LoginOf(TRemote const& remote, std::string const& netrcFile) {
   return {};
 }
 
-// While it lives, the signals that end or stop a program wait; each that came has its effect at the end.
-class TSignalsLater {
-public:
-  TSignalsLater() {
-    ::sigemptyset(&fSignals);
-    for (int const signal : {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGTSTP}) ::sigaddset(&fSignals, signal);
-    ::sigprocmask(SIG_BLOCK, &fSignals, &fBefore);
-  }
-  ~TSignalsLater() { ::sigprocmask(SIG_SETMASK, &fBefore, nullptr); }
-  TSignalsLater(TSignalsLater const&) = delete;
-  TSignalsLater& operator=(TSignalsLater const&) = delete;
-
-  sigset_t const& Signals() const { return fSignals; }
-
-private:
-  sigset_t fSignals, fBefore;
-};
-
-// While it lives, the terminal on standard input shows nothing of what is typed.
-class TNoEcho {
-public:
-  TNoEcho() {
-    if (::tcgetattr(STDIN_FILENO, &fSettings) != 0) ThrowNoTerminal();
-    termios settings = fSettings;
-    settings.c_lflag &= ~static_cast<tcflag_t>(ECHO);
-    if (::tcsetattr(STDIN_FILENO, TCSAFLUSH, &settings) != 0) ThrowNoTerminal();
-  }
-  ~TNoEcho() { ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &fSettings); }
-  TNoEcho(TNoEcho const&) = delete;
-  TNoEcho& operator=(TNoEcho const&) = delete;
-
-private:
-  [[noreturn]] static void ThrowNoTerminal() {
-    throw std::system_error(errno, std::generic_category(), "the terminal cannot be kept from showing a password");
-  }
-
-  termios fSettings;
-};
-
-// Waits until a line is typed; false when a signal comes first.
-bool IsLineTyped(sigset_t const& signals) {
-  int const signalFile = ::signalfd(-1, &signals, SFD_CLOEXEC);
-  if (signalFile < 0) throw std::system_error(errno, std::generic_category(), "no wait for signals");
-  pollfd waiting[] = {{STDIN_FILENO, POLLIN, 0}, {signalFile, POLLIN, 0}};
-  ::poll(waiting, 2, -1);
-  ::close(signalFile);
-  return waiting[1].revents == 0;
-}
-
-// Whether there is an answer: none when a signal came, which has its effect before this returns.
-bool HasAnswer(TRemote const& remote, std::string& password) {
-  TSignalsLater const later;
-  TNoEcho const noEcho;
-  std::cerr << "Password of " << Printable(remote.fUser) << " at " << Printable(remote.fHost) << ": " << std::flush;
-  bool const isTyped = IsLineTyped(later.Signals());
-  if (isTyped) std::getline(std::cin, password);
-  std::cerr << "\n";
-  return isTyped;
-}
-
-std::string AskForPassword(TRemote const& remote) {
-  std::string password;
-  while (!HasAnswer(remote, password)) {
-  }  // zep was stopped and goes on
-  return password;
-}
-
 }  // namespace
 
 TRemote RemoteOf(std::string const& text, std::string const& schemeOtherwise) {
@@ -258,7 +185,8 @@ void FindPassword(TRemote& remote, std::string const& netrcFile) {
   TLogin const login = LoginOf(remote, netrcFile.empty() ? DefaultNetrc() : netrcFile);
   if (remote.fUser.empty()) remote.fUser = login.fUser;
   remote.fPassword = login.fPassword;
-  if (remote.fPassword.empty() && !remote.fUser.empty() && ::isatty(STDIN_FILENO)) remote.fPassword = AskForPassword(remote);
+  if (remote.fPassword.empty() && !remote.fUser.empty() && ::isatty(STDIN_FILENO))
+    remote.fPassword = TypedPassword(remote.fUser + " at " + remote.fHost, "write it to a netrc file");
 }
 
 }  // namespace NQRVZEP20::zep

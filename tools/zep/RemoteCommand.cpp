@@ -121,7 +121,7 @@ int Remote(TArguments const& arguments) {
       arguments.fHostsFile.empty() ? std::vector<std::string>() : HostsIn(arguments.fHostsFile);
   if (!arguments.fDebugLog.empty()) WriteDebugLog(arguments.fDebugLog);
   WarnOfPasswords();
-  TAccount const account = {arguments.fUser, AskForPassword(arguments.fUser, arguments.fPasswordFile)};
+  TAccount const account = {arguments.fUser, ControllerPassword(arguments.fUser, arguments.fPasswordFile)};
   return arguments.fHostsFile.empty() ? AskOne(account, arguments) : AskList(hosts, account, arguments);
 }
 

@@ -51,10 +51,6 @@ public:
   void EnumerateQualifiers(boost::function<bool(boost::shared_ptr<ICIMQualifier>)>, TCIMContext const&) const override {
     Refuse();
   }
-  boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl>, TCIMValue const&, unsigned int,
-                                                TCIMContext const&) override {
-    Refuse();
-  }
 
   TCalls fCalls;
 
@@ -124,6 +120,8 @@ public:
     return fInstances.back();
   }
 
+  TFakeInstance& OnlyInstance() { return *fInstances.at(0); }
+
   std::string GetName(TCIMContext const& context) const override { return fCalls.Record(context), fName; }
   boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) const override {
     fCalls.Record(context);
@@ -141,12 +139,12 @@ public:
   void EnumerateInstances(boost::function<bool(boost::shared_ptr<ICIMInstance>)> callback,
                           TCIMContext const& context) const override {
     fCalls.Record(context);
+    if (fEnumerationFailure) throw TZEPException(*fEnumerationFailure);
     for (auto const& instance : fInstances)
       if (!callback(instance)) return;
   }
 
   bool GetClassFlag(TCIMContext const&) const override { Refuse(); }
-  bool IsAbstract(TCIMContext const&) const override { Refuse(); }
   bool IsRootClass(TCIMContext const&) const override { Refuse(); }
   boost::shared_ptr<ICIMClass> GetSuperClass(TCIMContext const&) const override { Refuse(); }
   void EnumerateSubClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)>, TCIMContext const&) const override { Refuse(); }
@@ -156,29 +154,21 @@ public:
   void EnumeratePropertyDecls(boost::function<bool(boost::shared_ptr<ICIMPropertyDecl>)>, TCIMContext const&) const override {
     Refuse();
   }
-  void SetStaticProperty(std::string const&, TCIMValue const&, TCIMContext const&) override { Refuse(); }
   void EnumerateStaticProperties(boost::function<bool(boost::shared_ptr<ICIMProperty>)>, TCIMContext const&) const override {
     Refuse();
   }
   boost::shared_ptr<ICIMInstance> CreateInstance(TCIMContext const&) override { Refuse(); }
-  boost::shared_ptr<ICIMMethodDecl> AddMethodDecl(std::string const&, TCIMValue::TCIMType, TCIMContext const&) override {
-    Refuse();
-  }
   void EnumerateMethodDecls(boost::function<bool(boost::shared_ptr<ICIMMethodDecl>)>, TCIMContext const&) const override {
     Refuse();
   }
-  void CommitInstance(boost::shared_ptr<ICIMInstance>, TCIMContext const&) override { Refuse(); }
   boost::shared_ptr<ICIMQualifier> GetQualifier(std::string const&, TCIMContext const&) const override { Refuse(); }
   void EnumerateQualifiers(boost::function<bool(boost::shared_ptr<ICIMQualifier>)>, TCIMContext const&) const override {
-    Refuse();
-  }
-  boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl>, TCIMValue const&, unsigned int,
-                                                TCIMContext const&) override {
     Refuse();
   }
 
   std::map<std::string, boost::shared_ptr<TFakePropertyDecl>> fDecls;
   bool fAnswersUnknownByEmpty = false;
+  std::optional<EZEPStatusCode> fEnumerationFailure;  // of EnumerateInstances
   TCalls fCalls;
 
 private:
@@ -207,6 +197,7 @@ public:
   boost::shared_ptr<ICIMInstance> GetInstance(TCIMReference const& path, TCIMContext const& context) const override {
     fLookedUp.push_back(&path);
     fLookedUpContexts.push_back(context);
+    if (fInstanceFailure) throw TZEPException(*fInstanceFailure);
     return fInstance;
   }
 
@@ -223,6 +214,7 @@ public:
   bool fAnswersUnknownByEmpty = false;
 
   boost::shared_ptr<ICIMInstance> fInstance;  // what GetInstance answers
+  std::optional<EZEPStatusCode> fInstanceFailure;
   mutable std::vector<TCIMReference const*> fLookedUp;
   mutable std::vector<TCIMContext> fLookedUpContexts;
 

@@ -15,10 +15,6 @@ public:
   std::string GetName(TCIMContext const&) const override { return "Bare"; }
   boost::shared_ptr<ICIMQualifier> GetQualifier(std::string const&, TCIMContext const&) const override { return {}; }
   void EnumerateQualifiers(boost::function<bool(boost::shared_ptr<ICIMQualifier>)>, TCIMContext const&) const override {}
-  boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl>, TCIMValue const&, unsigned int,
-                                                TCIMContext const&) override {
-    Refuse();
-  }
 };
 
 class TBareMethodDecl : public TBareElement<ICIMMethodDecl> {
@@ -52,9 +48,21 @@ TEST(InterfaceBodiesTest, WhatNeedsAnAnswerIsNotImplemented) {
   const TFakePropertyDecl property("Id", ECIMType::kCIMTypeUint32, TCIMValue(1u));
   EXPECT_STATUS(ns->GetName(none), kZEPStatusNotImplemented);
   EXPECT_STATUS(ns->CreateQualifierDecl("Key", TCIMValue(false), 0, 0, none), kZEPStatusNotImplemented);
+  ICIMClass& cls = ns->Add("X_Disk");
+  EXPECT_STATUS(cls.AddQualifier(nullptr, TCIMValue(true), 0, none), kZEPStatusNotImplemented);
+  EXPECT_STATUS(cls.SetStaticProperty("Id", TCIMValue(1u), none), kZEPStatusNotImplemented);
+  EXPECT_STATUS(cls.AddMethodDecl("Reset", ECIMType::kCIMTypeUint32, none), kZEPStatusNotImplemented);
+  EXPECT_STATUS(cls.CommitInstance(nullptr, none), kZEPStatusNotImplemented);
+  EXPECT_STATUS(instance.GetClass(none), kZEPStatusNotImplemented);
   EXPECT_STATUS(instance.GetPath(none), kZEPStatusNotImplemented);
   EXPECT_STATUS(property.IsKey(none), kZEPStatusNotImplemented);
   EXPECT_STATUS(TBareQualifier().GetDeclaration(none), kZEPStatusNotImplemented);
+}
+
+TEST(InterfaceBodiesTest, AClassIsNotAbstract) {
+  const auto ns = boost::make_shared<TFakeNamespace>();
+  ICIMClass const& cls = ns->Add("X_Disk");
+  EXPECT_FALSE(cls.IsAbstract(TCIMContext()));
 }
 
 TEST(InterfaceBodiesTest, BackPointersAreEmpty) {

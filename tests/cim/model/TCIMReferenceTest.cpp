@@ -757,6 +757,15 @@ TEST_F(TCIMReferenceTest, TheElementIsLookedUpOnceAndNeverAgain) {
   EXPECT_EQ(ns_->fLookedUp.size(), 1u);
 }
 
+TEST_F(TCIMReferenceTest, AFailureOfTheLookUpPassesAndIsNotRemembered) {
+  TCIMReference const disk = Disk(5);
+  ns_->fInstanceFailure = kZEPStatusAccessDenied;
+  EXPECT_STATUS(disk.GetCIMElement(false), kZEPStatusAccessDenied);
+  ns_->fInstanceFailure.reset();
+  ns_->fInstance = boost::make_shared<TFakeInstance>();
+  EXPECT_EQ(disk.GetCIMElement(false), ns_->fInstance);
+}
+
 TEST_F(TCIMReferenceTest, AnUnknownInstanceThrowsNotFoundAndIsAskedForAgain) {
   TCIMReference const disk = Disk(5);
   TLogCapture log;

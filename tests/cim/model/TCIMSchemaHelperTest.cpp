@@ -145,6 +145,9 @@ TEST_F(TCIMSchemaHelperTest, WhatIsMissingThrowsNotFound) {
     EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);
     instance->fCalls.fFailure.reset();
     instance->Add(row.property, TCIMValue("1234ABC"));
+    cls.fEnumerationFailure = kZEPStatusNotFound;
+    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // nor instances to enumerate
+    cls.fEnumerationFailure.reset();
     cls.AddInstance()->Add(row.property, TCIMValue("1234ABC"));
     EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // two instances
   }
@@ -181,8 +184,18 @@ TEST_F(TCIMSchemaHelperTest, OtherFailuresOfTheNamespacePass) {
   for (auto const& row : queries) {
     SCOPED_TRACE(row.name);
     auto const ns = With(row.className, row.property, TCIMValue("1234ABC"));
+    TLogCapture log;
     ns->fCalls.fFailure = kZEPStatusConnectionFailed;
     EXPECT_STATUS(row.query(ns), kZEPStatusConnectionFailed);
+    ns->fCalls.fFailure.reset();
+    auto& cls = *ns->Class(row.className);
+    cls.fEnumerationFailure = kZEPStatusAccessDenied;
+    EXPECT_STATUS(row.query(ns), kZEPStatusAccessDenied);
+    cls.fEnumerationFailure.reset();
+    auto const broken = With(row.className, row.property, TCIMValue("1234ABC"));
+    broken->Class(row.className)->OnlyInstance().fCalls.fFailure = kZEPStatusFail;
+    EXPECT_STATUS(row.query(broken), kZEPStatusFail);
+    for (auto const& entry : log.Entries()) EXPECT_EQ(entry, "[Debug] TCIMSchemaHelper- Detected MTM Entered");
   }
 }
 
@@ -242,6 +255,8 @@ TEST_F(TCIMSchemaHelperTest, LoggedQueriesLogEachReasonAtDebug) {
     auto const none = boost::make_shared<TFakeNamespace>();
     auto const noInstance = boost::make_shared<TFakeNamespace>();
     noInstance->Add("QRVSG_ComputerSystem");
+    auto const cannotEnumerate = With("QRVSG_ComputerSystem", property, TCIMValue("1234ABC"));
+    cannotEnumerate->Class("QRVSG_ComputerSystem")->fEnumerationFailure = kZEPStatusNotFound;
     auto const two = With("QRVSG_ComputerSystem", property, TCIMValue("1234ABC"));
     two->Class("QRVSG_ComputerSystem")->AddInstance();
     auto const noProperty = With("QRVSG_ComputerSystem", "Other", TCIMValue("1234ABC"));
@@ -252,6 +267,7 @@ TEST_F(TCIMSchemaHelperTest, LoggedQueriesLogEachReasonAtDebug) {
         {none, "TCIMSchemaHelper: no computer system"},
         {noInstance, "TCIMSchemaHelper: computer system instances != 1"},
         {two, "TCIMSchemaHelper: computer system instances != 1"},
+        {cannotEnumerate, "TCIMSchemaHelper: computer system instances != 1"},
         {noProperty, "TCIMSchemaHelper: didn't find " + property + " property"},
         {With("QRVSG_ComputerSystem", property, NullOf(ECIMType::kCIMTypeString)), "TCIMSchemaHelper: " + property + " is NULL"},
         {With("QRVSG_ComputerSystem", property, NullOf(ECIMType::kCIMTypeUint32)), "TCIMSchemaHelper: " + property + " is NULL"},
@@ -656,6 +672,12 @@ TEST_F(TCIMSchemaHelperEsxiTest, OtherFailuresOfTheNamespacePass) {
   EXPECT_STATUS(TCIMSchemaHelper::GetMTM_vmwesxi(ns_), kZEPStatusConnectionFailed);
   EXPECT_STATUS(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), kZEPStatusConnectionFailed);
   EXPECT_STATUS(SerialNumber(), kZEPStatusConnectionFailed);
+
+  ns_->fCalls.fFailure.reset();
+  ns_->Add("CIM_PhysicalElement").fEnumerationFailure = kZEPStatusAccessDenied;
+  EXPECT_STATUS(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), kZEPStatusAccessDenied);
+  ns_->Add("CIM_PhysicalElement").fEnumerationFailure = kZEPStatusNotFound;
+  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Unknown");
 }
 
 TEST_F(TCIMSchemaHelperEsxiTest, LogsNothingAndCarriesTheProviderToAsk) {

@@ -10,6 +10,8 @@
 namespace NQRVZEP20 {
 namespace {
 
+bool const gIsThereBeforeMain = TNamespaceProviderManager::fgInstance != nullptr;
+
 class TNamedProvider : public INamespaceProvider {
 public:
   explicit TNamedProvider(std::string name) : fName(std::move(name)) {}
@@ -49,6 +51,20 @@ TEST_F(TNamespaceProviderManagerTest, FindsAProviderByItsName) {
   manager_.RegisterNamespaceProvider(host);
   EXPECT_EQ(manager_.GetNamespaceProvider("Disks"), disks);
   EXPECT_EQ(manager_.GetNamespaceProvider("Host"), host);
+}
+
+TEST_F(TNamespaceProviderManagerTest, TheOneOfTheProcessIsMadeWhenTheLibraryIsLoaded) {
+  EXPECT_TRUE(gIsThereBeforeMain);
+  EXPECT_EQ(TNamespaceProviderManager::GetInstance(), TNamespaceProviderManager::fgInstance);
+}
+
+TEST_F(TNamespaceProviderManagerTest, AProviderWithoutANameToTellIsNotFiled) {
+  struct TNameless : TNamedProvider {
+    TNameless() : TNamedProvider("") {}
+    std::string const& GetName(TCIMContext const&) const override { throw TZEPException(kZEPStatusAccessDenied); }
+  };
+  EXPECT_STATUS(manager_.RegisterNamespaceProvider(boost::make_shared<TNameless>()), kZEPStatusAccessDenied);
+  EXPECT_TRUE(Enumerate().empty());
 }
 
 TEST_F(TNamespaceProviderManagerTest, AsksForTheNameOnceWithAnEmptyContext) {

@@ -259,6 +259,27 @@ TEST_F(TCIMDateTimeTest, ValidationAgreesWithMktimeInEveryZone) {
   }
 }
 
+TEST_F(TCIMDateTimeTest, ATimeThatItsZoneSkippedIsInvalid) {
+  struct {
+    char const *zone, *text;
+  } const rows[] = {
+      {"Asia/Kathmandu", "19860101000500.000000+000"},  {"Europe/Moscow", "20110327023000.000000+000"},
+      {"Asia/Singapore", "19811231233000.000000+000"},  {"America/Caracas", "20160501024500.000000+000"},
+      {"Pacific/Fakaofo", "20111230120000.000000+000"}, {"Pacific/Fakaofo", "20111230130000.000000+060"},
+  };
+  for (auto const& row : rows) {
+    SCOPED_TRACE(row.zone);
+    NEEDS(std::filesystem::exists(std::string("/usr/share/zoneinfo/") + row.zone), "the zones (package tzdata)");
+    TEnvironmentGuard const zone("TZ", row.zone);
+    TCIMDateTime dateTime = At("20070315143000.000000+060");
+    EXPECT_STATUS(dateTime = At(row.text), kZEPStatusInvalidDateTime);
+    EXPECT_STATUS(dateTime.Set(row.text), kZEPStatusInvalidDateTime);
+    EXPECT_EQ(dateTime.ToString(), "20070315143000.000000+060");
+    ::setenv("TZ", "UTC0", 1);
+    EXPECT_NO_THROW(dateTime.Set(row.text));
+  }
+}
+
 // ---- Reading text ----
 
 TEST_F(TCIMDateTimeTest, ReadsATimestamp) {

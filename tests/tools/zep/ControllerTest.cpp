@@ -186,6 +186,12 @@ TEST_F(ZepRemoteTest, ThePasswordIsAskedForWithoutEcho) {
 
 TEST_F(ZepRemoteTest, AnInterruptInsteadOfThePasswordEndsIt) {
   TSession const session = TypeAt(zep_, "zepp\x03");
+  EXPECT_EQ(session.status, 128 + SIGINT);
+  EXPECT_EQ(session.shown, "Password of zepadmin: \r\n");
+}
+
+TEST_F(ZepRemoteTest, WithoutAPasswordNothingIsAsked) {
+  TSession const session = TypeAt(zep_, "\x04");
   EXPECT_EQ(session.status, 1);
   EXPECT_EQ(session.shown, "Password of zepadmin: \r\nzep: no password was given\r\n");
 }
