@@ -296,6 +296,12 @@ TEST_F(IIPMILanTest, WithoutTheUsbLanLibraryOrOneOfItsFunctionsNothingIsBroughtU
   }
 }
 
+TEST_F(IIPMILanTest, AUsbLanLibraryThatLacksWhatItDoesNotCallIsUsed) {
+  UseUsbLan("unresolved", "0");
+  EXPECT_EQ(::dlopen("./ovdusblan.so", RTLD_NOW), nullptr) << "there should be something that is lacking";
+  EXPECT_TRUE(link_->bringupOvdLan());
+}
+
 TEST_F(IIPMILanTest, TheUsbLanLibraryIsTheOneInTheWorkingDirectory) {
   UseUsbLan("whole");
   std::filesystem::create_directory(dir_.Path("elsewhere"));

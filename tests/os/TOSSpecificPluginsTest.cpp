@@ -282,6 +282,12 @@ TEST_F(RootPathTest, TheServicesComeInTheOrderOfTheDirectory) {
   EXPECT_EQ(Probe("nsps"), expected);
 }
 
+// ---- Without any platform library beside the core library ----
+
+TEST_F(RootPathTest, WithoutTheIpmiClientNoControllerAnswers) {
+  EXPECT_THAT(Probe("controller"), ElementsAre("[]", "not connected"));
+}
+
 // ---- Loading ----
 
 TEST_F(RootPathTest, ALoadedProviderHasRegisteredItselfAndIsSeenByAll) {

@@ -263,6 +263,14 @@ TEST_F(SetDebugLevelTest, ReadsTheMachineTypeBeforeTheThresholdChanges) {
                           "[Debug] getMachineType() completed."));
 }
 
+TEST_F(SetDebugLevelTest, APathThatIsGivenCountsInBothVariants) {
+  TFakeClock const clock(k3March2024);
+  std::filesystem::create_directory("docs");
+  WriteFile("docs/oem_zep_preboot_readme.txt", "");
+  EXPECT_TRUE(SetDebugLevel(2, dir_.Path("zep_")));
+  EXPECT_TRUE(std::filesystem::exists(dir_.Path("zep_000020240303-090507.log")));
+}
+
 // Without a path the file lies in a directory of the system. Tests do not write there: they look at a tree of their own.
 TEST_F(SetDebugLevelTest, WithoutAPathTheVariantNamesTheDirectory) {
   NEEDS(::geteuid() == 0, "root, for a mount namespace");
@@ -280,7 +288,8 @@ TEST_F(SetDebugLevelTest, WithoutAPathTheVariantNamesTheDirectory) {
     ASSERT_EQ(std::system(("unshare --mount sh " + program).c_str()), 0);
     std::string const listed = ReadFile(made);
     std::string const heading = isOEM ? "/var/log/OEM_Support:\n" : "/var/log/QRV_Support:\n";
-    EXPECT_NE(listed.find(heading + "zep_0000"), std::string::npos) << listed;
+    EXPECT_THAT(listed, testing::HasSubstr(heading + "zep_0000"));
+    EXPECT_THAT(listed, testing::ContainsRegex("zep_0000[0-9]{8}-[0-9]{6}\\.log\n"));
   }
 }
 

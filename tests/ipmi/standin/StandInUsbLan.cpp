@@ -31,6 +31,11 @@ void Called(std::string const& function, std::string const& arguments) {
 
 #pragma GCC visibility push(default)
 
+#ifdef STANDIN_UNRESOLVED
+int ThereIsNoSuchFunction();
+int CallThereIsNoSuchFunction() { return ThereIsNoSuchFunction(); }
+#endif
+
 #ifndef STANDIN_WITHOUT_NODES
 int GetNodes() {
   Called("GetNodes", "");

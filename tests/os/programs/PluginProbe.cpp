@@ -1,8 +1,9 @@
 // Calls one operation on plug-ins and prints what comes of it: the results, one a line; what was thrown; what was recorded in
 // the log, with its severity. With "load-plugins", one attempt for each path.
 //
-//   PluginProbe root | nsps | nsps-elsewhere | nscs | services KIND | load-nsp NAME | load-nsc NAME | load-plugins PATH...
+//   PluginProbe controller | root | nsps | nsps-elsewhere | nscs | services KIND | load-nsp NAME | load-nsc NAME | load-plugins PATH...
 
+#include "IIPMILan.h"
 #include "INamespaceConsumer.h"
 #include "INamespaceProvider.h"
 #include "TLogger.h"
@@ -50,8 +51,17 @@ void LoadPlugin(std::string const& path) {
   if (auto const function = reinterpret_cast<int (*)()>(::dlsym(library, "TwiceTheDiskCount"))) std::cout << function() << "\n";
 }
 
+void AskController() {
+  Print({"[" + TOSSpecific::GetRemoteMSN("h", "u", "p") + TOSSpecific::GetRemoteMT("h", "u", "p") +
+         TOSSpecific::GetRemoteMachineModel("h", "u", "p") + "]"});
+  IIPMILan& link = *IIPMILan::Initialize();
+  std::cout << (link.IpmilanOpenConnect("h", "u", "p") ? "connected" : "not connected") << "\n";
+  link.IpmilanCloseConnect();
+}
+
 void PrintThrown(std::string const& operation, std::string const& argument) {
   try {
+    if (operation == "controller") AskController();
     if (operation == "root") Print({TOSSpecific::GetZEPRootPath()});
     if (operation == "nsps") Print(TOSSpecific::FindNSPs());
     if (operation == "nsps-elsewhere" && ::chdir("/proc") == 0) Print(TOSSpecific::FindNSPs());
