@@ -6,6 +6,7 @@
 
 #include <cstdio>
 #include <memory>
+#include <string>
 #include <utility>
 
 namespace NQRVZEP20 {
@@ -32,6 +33,12 @@ using TSharedLibrary = std::unique_ptr<void, TLibraryCloser>;
 template <class TFunction>
 TFunction* FunctionOf(void* library, char const* name) {
   return reinterpret_cast<TFunction*>(::dlsym(library, name));
+}
+
+// Why the call of the linker before failed; empty when it did not.
+inline std::string LinkerReason() {
+  char const* const reason = ::dlerror();
+  return reason ? reason : "";
 }
 
 class TUniqueFd {

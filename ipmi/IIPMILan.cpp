@@ -1,7 +1,6 @@
 #include "IIPMILan.h"
 
-#include "TRootObject.h"
-#include "core/IpmiClient.h"
+#include "core/IpmiLibrary.h"
 #include "core/Log.h"
 #include "ipmi/UsbLan.h"
 
@@ -27,8 +26,6 @@ std::string IIPMILan::m_LANMapping[MAXMULTINODE] = {
 };
 
 namespace {
-
-constexpr char const* kPort = "623";
 
 // Where the parts of a message lie, counted from its first byte.
 constexpr std::ptrdiff_t kCompletionCode = 6;
@@ -100,7 +97,7 @@ bool IIPMILan::IpmilanOpenConnect(std::string host, std::string user, std::strin
   LogDebug("password: ", password);  // in clear text. Kept.
   const int result = OpenIpmiConnection(host, user, password);
   gIPMILanHost = host;
-  gIPMILanPort = kPort;
+  gIPMILanPort = kIpmiPort;
   gIPMILanUser = user;
   gIPMILanPass = password;
   if (result != 0) {
@@ -121,7 +118,7 @@ bool IIPMILan::OpenNode(int node) {
 
 bool IIPMILan::IpmiInBandLanConnect(int node, std::string pluginName) {
   if (m_enabled == 0) return false;
-  if (TRootObject::GetipmiLanIns() == nullptr || m_useGlobalAccount) return false;
+  if (fgipmilanInstance == nullptr || m_useGlobalAccount) return false;
   if (node == fCurrentNode && getipmiLanStatus()) return true;
   try {
     const bool isOpen = OpenNode(node);

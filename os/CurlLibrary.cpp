@@ -7,11 +7,6 @@
 namespace NQRVZEP20 {
 namespace {
 
-std::string LinkerReason() {
-  char const* const reason = ::dlerror();
-  return reason ? reason : "";
-}
-
 // Ends the search at the first function that is missing, of which the linker tells.
 template <class TFunction>
 TFunction* FunctionOrThrow(void* library, char const* name, char const* message) {

@@ -1,8 +1,9 @@
-#include "TLogger.h"
 #include "TOSSpecific.h"
+
+#include "TLogger.h"
 #include "TZEPStatusCode.h"
 #include "core/Handles.h"
-#include "core/IpmiClient.h"
+#include "core/IpmiLibrary.h"
 #include "core/Log.h"
 #include "os/LocalTime.h"
 #include "os/MachineIdentity.h"

@@ -65,11 +65,6 @@ std::string CompanionPath(std::string const& pluginPath, std::string const& kind
 // Null when it cannot be loaded. No handle is ever closed: what is loaded stays to the end of the process.
 void* Load(std::string const& path) { return ::dlopen(path.c_str(), RTLD_NOW | RTLD_GLOBAL); }
 
-std::string LinkerReason() {
-  char const* const reason = ::dlerror();
-  return reason ? reason : "";
-}
-
 }  // namespace
 
 std::string TOSSpecific::GetZEPRootPath() {

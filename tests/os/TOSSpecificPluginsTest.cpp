@@ -288,6 +288,11 @@ TEST_F(RootPathTest, WithoutTheIpmiClientNoControllerAnswers) {
   EXPECT_THAT(Probe("controller"), ElementsAre("[]", "not connected"));
 }
 
+TEST_F(RootPathTest, AnIpmiClientThatComesLaterIsLoadedThen) {
+  EXPECT_THAT(Probe("controller '' " ZEP_IPMI_STANDINS "/whole/libipmiClient.so"),
+              ElementsAre("[]", "not connected", testing::_, "connected"));
+}
+
 // ---- Loading ----
 
 TEST_F(RootPathTest, ALoadedProviderHasRegisteredItselfAndIsSeenByAll) {

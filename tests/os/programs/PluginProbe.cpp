@@ -1,7 +1,8 @@
 // Calls one operation on plug-ins and prints what comes of it: the results, one a line; what was thrown; what was recorded in
-// the log, with its severity. With "load-plugins", one attempt for each path.
+// the log, with its severity. With several arguments, one attempt for each.
 //
-//   PluginProbe controller | root | nsps | nsps-elsewhere | nscs | services KIND | load-nsp NAME | load-nsc NAME | load-plugins PATH...
+//   PluginProbe controller [LIBRARY]... | root | nsps | nsps-elsewhere | nscs | services KIND | load-nsp NAME |
+//               load-nsc NAME | load-plugins PATH...
 
 #include "IIPMILan.h"
 #include "INamespaceConsumer.h"
@@ -14,6 +15,7 @@
 #include <dlfcn.h>
 #include <unistd.h>
 
+#include <filesystem>
 #include <iostream>
 #include <memory>
 
@@ -51,7 +53,9 @@ void LoadPlugin(std::string const& path) {
   if (auto const function = reinterpret_cast<int (*)()>(::dlsym(library, "TwiceTheDiskCount"))) std::cout << function() << "\n";
 }
 
-void AskController() {
+// With a library that is put beside the core library first, where one is given.
+void AskController(std::string const& client) {
+  if (!client.empty()) std::filesystem::copy_file(client, TOSSpecific::GetZEPRootPath() + "/libipmiClient.so");
   Print({"[" + TOSSpecific::GetRemoteMSN("h", "u", "p") + TOSSpecific::GetRemoteMT("h", "u", "p") +
          TOSSpecific::GetRemoteMachineModel("h", "u", "p") + "]"});
   IIPMILan& link = *IIPMILan::Initialize();
@@ -61,7 +65,7 @@ void AskController() {
 
 void PrintThrown(std::string const& operation, std::string const& argument) {
   try {
-    if (operation == "controller") AskController();
+    if (operation == "controller") AskController(argument);
     if (operation == "root") Print({TOSSpecific::GetZEPRootPath()});
     if (operation == "nsps") Print(TOSSpecific::FindNSPs());
     if (operation == "nsps-elsewhere" && ::chdir("/proc") == 0) Print(TOSSpecific::FindNSPs());

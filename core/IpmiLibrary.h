@@ -14,7 +14,9 @@ namespace NQRVZEP20 {
 // Each function returns what the library returns, 0 for success; kZEPStatusFileSystemError when it could not be loaded,
 // kZEPStatusNotFound when it lacks the function.
 
-// Opens a session over the LAN, on the port "623".
+constexpr char const* kIpmiPort = "623";
+
+// Opens a session over the LAN, on that port.
 int OpenIpmiConnection(std::string const& host, std::string const& user, std::string const& password);
 
 struct TIpmiCommand {
