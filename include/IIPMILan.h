@@ -40,7 +40,7 @@ public:
 
   // ---- Accounts ----
 
-  // Stores the account of a node. An index above 15 is logged and changes nothing; one below 0 is not to be passed.
+  // Stores the account of a node. An index above 15 is logged and changes nothing; one below 0 changes nothing.
   void setAccount(int index, std::string user, std::string password);
 
   // The account and the host in use: those of the open session while m_useGlobalAccount is set, otherwise those of the
@@ -60,9 +60,10 @@ public:
   // clear text at debug severity. Kept.
   bool IpmilanOpenConnect(std::string host, std::string user, std::string password);
 
-  // Connects to the controller of `node` (0 to 15, not checked) at its USB-LAN address, with the node's account; the name
-  // of the plug-in is for the log. Without a new session when the node is the current one and a response was valid since
-  // the session began. False without trying while m_enabled is 0 or m_useGlobalAccount is set.
+  // Connects to the controller of `node` (0 to 15) at its USB-LAN address, with the node's account; any other node becomes
+  // the current one as well and is opened with an empty address and account. The name of the plug-in is for the log.
+  // Without a new session when the node is the current one and a response was valid since the session began. False without
+  // trying while m_enabled is 0 or m_useGlobalAccount is set.
   bool IpmiInBandLanConnect(int node, std::string pluginName);
 
   // Closes the session and the socket and forgets the session's parameters.
@@ -98,7 +99,7 @@ public:
   // it; behind the length byte the packet's area must hold as many bytes as that says, and at least 7.
   bool ChkResponse(char* packet, int lengthPosition, int mode);
 
-  static IIPMILan* fgipmilanInstance;             // null until the first use
+  static IIPMILan* fgipmilanInstance;             // null before Initialize
   static std::string m_LANMapping[MAXMULTINODE];  // the USB-LAN address of each node's controller
 
   // ---- For the caller to fill in; the link itself only hands them out and asks the two flags ----
