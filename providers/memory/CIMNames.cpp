@@ -26,7 +26,7 @@ void RequireCIMName(std::string const& text) {
   if (!IsCIMName(text)) throw TZEPException(kZEPStatusInvalidCIMName);
 }
 
-bool IsSameName(std::string const& a, std::string const& b) {
+bool IsSameName(std::string_view a, std::string_view b) {
   return a.size() == b.size() && std::equal(a.begin(), a.end(), b.begin(), [](char x, char y) { return Fold(x) == Fold(y); });
 }
 

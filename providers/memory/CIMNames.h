@@ -2,6 +2,7 @@
 
 #include <cstddef>
 #include <string>
+#include <string_view>
 
 namespace NQRVZEP20 {
 
@@ -15,7 +16,7 @@ bool IsCIMName(std::string const& text);
 // Throws kZEPStatusInvalidCIMName for what is no CIM name.
 void RequireCIMName(std::string const& text);
 
-bool IsSameName(std::string const& a, std::string const& b);
+bool IsSameName(std::string_view a, std::string_view b);
 
 // The name in small letters: one text for every spelling.
 std::string FoldName(std::string name);

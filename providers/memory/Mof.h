@@ -22,8 +22,8 @@ void ReadMofText(std::string const& text, std::string const& name, boost::shared
 // The whole namespace: qualifier declarations, plain classes, associations, instances, each in the order of the
 // enumerations. ReadMofText makes an equal namespace of it, and a copy of the namespace has the same text. Throws
 // kZEPStatusNotSupported for what MOF cannot say: references to no class, arrays of references as properties, numbers
-// that are not finite, datetimes of more than 25 characters, a static value that its class does not declare or that has
-// a default besides.
+// that are not finite, datetimes of more than 25 characters, NULL characters, a static value that its class does not
+// declare or that has a default besides.
 std::string WriteMof(ICIMNamespace const& ns);
 
 // One class, without instances.

@@ -1,11 +1,12 @@
 // Object paths in the form of DSP0004.
 
+#include "MofValues.h"
+
 #include "CIMNames.h"
 #include "ICIMClass.h"
 #include "ICIMPropertyDecl.h"
 #include "MofNumbers.h"
 #include "MofStrings.h"
-#include "MofValues.h"
 #include "TMofLexer.h"
 
 #include <utility>
@@ -56,7 +57,7 @@ private:
       literal.fKind = TMofLiteral::kChar;
     else {  // a word or a number, which may stand in quotes
       if (isQuoted) literal.fPlace.fText = token.fText.substr(1, token.fText.size() - 2);
-      const std::string word(literal.fPlace.fText);
+      const std::string_view word = literal.fPlace.fText;
       literal.fKind = IsSameName(word, "true") || IsSameName(word, "false") ? TMofLiteral::kBoolean : TMofLiteral::kNumber;
       if (word.empty()) Refuse(token);
     }
@@ -91,7 +92,7 @@ TCIMValue ReadMofPath(std::string const& path, TMofPlace const& place, boost::sh
 }
 
 std::string MofPathText(TCIMReference const& path) {
-  if (!path.GetClass()) throw TZEPException(kZEPStatusNotSupported);
+  if (!path.GetClass()) ThrowUnprintable();
   std::string text = path.GetClassName();
   char before = '.';
   path.EnumerateKeyBindings([&](std::pair<std::string, TCIMValue> const& key) {

@@ -16,7 +16,7 @@ auto AtPlace(TMofPlace const& place, EZEPStatusCode expected, char const* words,
     throw;
   } catch (TZEPException const& reason) {
     const EZEPStatusCode status = reason.GetStatusCode().GetCode();
-    const std::string name(place.fText);
+    const std::string name = NameAt(place);
     throw TMofError(place, status == expected ? name + " " + words : name + " is refused: " + reason.what(), status);
   }
 }

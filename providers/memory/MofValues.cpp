@@ -33,7 +33,7 @@ TCIMValue StringValue(TMofLiteral const& literal, TType type, boost::shared_ptr<
 TCIMValue ScalarValue(TMofLiteral const& literal, TType type, boost::shared_ptr<ICIMNamespace> const& ns) {
   switch (literal.fKind) {
     case TMofLiteral::kNull:
-      return NullOf(type, 0);
+      return TCIMValue(type, 0);
     case TMofLiteral::kString:
       return StringValue(literal, type, ns);
     case TMofLiteral::kNumber:
@@ -50,11 +50,16 @@ TCIMValue ScalarValue(TMofLiteral const& literal, TType type, boost::shared_ptr<
   Refuse(literal, type);
 }
 
-[[noreturn]] void ThrowUnprintable() { throw TZEPException(kZEPStatusNotSupported); }
+// The value has no text when its character is NULL.
+std::string CharacterText(TCIMValue const& value) {
+  try {
+    return EscapedCharacter(static_cast<unsigned short>(std::stoul(value.ToString())));
+  } catch (TZEPException const&) {
+    ThrowUnprintable();
+  }
+}
 
-// A value that holds a NULL character is NULL to the reader.
-std::string CharacterText(std::string const& code) { return EscapedCharacter(static_cast<unsigned short>(std::stoul(code))); }
-
+// A value that holds a NULL datetime is NULL to the reader.
 std::string DateTimeText(TCIMDateTime const& datetime) {
   if (datetime.IsNull()) return "NULL";
   const std::string text = datetime.ToString();
@@ -64,15 +69,11 @@ std::string DateTimeText(TCIMDateTime const& datetime) {
 
 }  // namespace
 
-TCIMValue NullOf(TType type, unsigned int maxArraySize) {
-  TCIMValue null;
-  null.SetNullValue(type, maxArraySize);
-  return null;
-}
+void ThrowUnprintable() { throw TZEPException(kZEPStatusNotSupported); }
 
 TCIMValue ReadMofValue(TMofValue const& value, TType type, unsigned int maxArraySize, boost::shared_ptr<ICIMNamespace> ns) {
   const bool isNull = !value.fIsArray && value.fLiterals.front().fKind == TMofLiteral::kNull;
-  if (isNull) return NullOf(type, maxArraySize);
+  if (isNull) return TCIMValue(type, IsArrayType(type) ? maxArraySize : 0);
   if (value.fIsArray && !IsArrayType(type)) throw TMofError(value.fPlace, "expected one value, not an array of them");
   if (!value.fIsArray && IsArrayType(type)) throw TMofError(value.fPlace, "expected an array of values in braces");
   if (!value.fIsArray) return ScalarValue(value.fLiterals.front(), type, ns);
@@ -97,7 +98,7 @@ std::string MofScalarText(TCIMValue const& value) {
     case TType::kCIMTypeDateTime:
       return DateTimeText(value);
     case TType::kCIMTypeChar16:
-      return CharacterText(value.ToString());
+      return CharacterText(value);
     case TType::kCIMTypeReference:
       return "\"" + Escaped(MofPathText(value)) + "\"";
     default:

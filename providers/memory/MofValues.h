@@ -9,7 +9,8 @@ namespace NQRVZEP20 {
 
 // Values as MOF writes them.
 
-TCIMValue NullOf(TCIMValue::TCIMType type, unsigned int maxArraySize);
+// For what MOF cannot say: kZEPStatusNotSupported.
+[[noreturn]] void ThrowUnprintable();
 
 // The literal, or the array of them, as a value of that type. References are object paths in strings, in `ns`. Throws
 // TMofError for what is not of the type or does not fit it.

@@ -1,7 +1,8 @@
+#include "Mof.h"
+
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
 #include "ICIMQualifierDecl.h"
-#include "Mof.h"
 #include "TAddToVectorCallback.h"
 #include "TMofWriter.h"
 

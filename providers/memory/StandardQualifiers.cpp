@@ -5,18 +5,6 @@
 
 namespace NQRVZEP20 {
 
-namespace {
-
-using TType = TCIMValue::TCIMType;
-
-TCIMValue NoValue(TType type) {
-  TCIMValue null;
-  null.SetNullValue(type, 0);
-  return null;
-}
-
-}  // namespace
-
 std::vector<TStandardQualifier> StandardQualifiers() {
   constexpr unsigned int kClass = ICIMQualifierDecl::kScopeClass;
   constexpr unsigned int kAssociation = ICIMQualifierDecl::kScopeAssociation;
@@ -34,9 +22,9 @@ std::vector<TStandardQualifier> StandardQualifiers() {
   constexpr unsigned int kFinal = ICIMQualifierDecl::kFlavorToSubclass;           // handed down, and not to be changed
   constexpr unsigned int kTranslatable = kDefault | ICIMQualifierDecl::kFlavorTranslatable;
 
-  const TCIMValue no(false), yes(true), noText = NoValue(TType::kCIMTypeString),
-                                        noTexts = NoValue(ArrayOf(TType::kCIMTypeString)),
-                                        noUint32 = NoValue(TType::kCIMTypeUint32), noSint64 = NoValue(TType::kCIMTypeSint64);
+  using TType = TCIMValue::TCIMType;
+  const TCIMValue no(false), yes(true), noText(TType::kCIMTypeString, 0), noTexts(ArrayOf(TType::kCIMTypeString), 0),
+      noUint32(TType::kCIMTypeUint32, 0), noSint64(TType::kCIMTypeSint64, 0);
   return {
       {"Abstract", no, kAnyClass, kRestricted},
       {"Aggregate", no, kReference, kFinal},

@@ -38,10 +38,4 @@ TMemoryType::TMemoryType(char const* text) : fType(TCIMValue::TCIMType::kCIMType
   }
 }
 
-TCIMValue TMemoryType::GetNull() const {
-  TCIMValue null;
-  null.SetNullValue(fType, fMaxArraySize);
-  return null;
-}
-
 }  // namespace NQRVZEP20

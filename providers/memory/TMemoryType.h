@@ -15,8 +15,8 @@ public:
   TMemoryType(TCIMValue::TCIMType::ECIMType type) : fType(type) {}
 
   TCIMValue::TCIMType GetType() const { return fType; }
-  unsigned int GetMaxArraySize() const { return fMaxArraySize; }  // 0: unbounded, or not an array
-  TCIMValue GetNull() const;                                      // a NULL value of this type
+  unsigned int GetMaxArraySize() const { return fMaxArraySize; }         // 0: unbounded, or not an array
+  TCIMValue GetNull() const { return TCIMValue(fType, fMaxArraySize); }  // a NULL value of this type
 
 private:
   TCIMValue::TCIMType fType;

@@ -19,8 +19,6 @@ using TType = TCIMValue::TCIMType;
 
 const TCIMContext kNone;
 
-std::string NameAt(TMofPlace const& place) { return std::string(place.fText); }
-
 }  // namespace
 
 void TMofBuilder::Build() {
@@ -33,7 +31,7 @@ void TMofBuilder::Build() {
 }
 
 void TMofBuilder::DeclareQualifier(TMofQualifierDecl const& decl) {
-  TCIMValue value = NullOf(decl.fType.fType, decl.fType.fMaxArraySize);
+  TCIMValue value(decl.fType.fType, decl.fType.fMaxArraySize);
   if (decl.fValue) value = ReadMofValue(*decl.fValue, decl.fType.fType, decl.fType.fMaxArraySize, fNamespace);
   AtPlace(decl.fName, kZEPStatusAlreadyExists, "is declared already",
           [&] { fNamespace->CreateQualifierDecl(NameAt(decl.fName), value, decl.fScope, decl.fFlavor, kNone); });
@@ -124,12 +122,12 @@ boost::shared_ptr<ICIMClass> TMofBuilder::FindClass(TMofPlace const& name) const
 // Whether they make the value of a property one of the class.
 bool TMofBuilder::HasStatic(TMofQualifiers const& qualifiers) {
   for (TMofQualifier const& qualifier : qualifiers)
-    if (IsSameName(NameAt(qualifier.fName), "Static")) return ValueOf(qualifier, Declared(qualifier.fName)) == TCIMValue(true);
+    if (IsSameName(qualifier.fName.fText, "Static")) return ValueOf(qualifier, Declared(qualifier.fName)) == TCIMValue(true);
   return false;
 }
 
 TCIMValue TMofBuilder::NullOfProperty(TMofType const& type) const {
-  TCIMValue null = NullOf(type.fType, type.fMaxArraySize);
+  TCIMValue null(type.fType, type.fMaxArraySize);
   if (BaseTypeOf(type.fType) != TType::kCIMTypeReference) return null;
   if (IsArrayType(type.fType)) throw TMofError(type.fReferencedClass, "a property cannot be an array of references");
   null.SetReferencedClass(FindClass(type.fReferencedClass));

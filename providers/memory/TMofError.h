@@ -20,6 +20,8 @@ struct TMofPlace {
   std::string_view fText = {};  // of fFile->fText
 };
 
+inline std::string NameAt(TMofPlace const& place) { return std::string(place.fText); }
+
 // What is wrong with a MOF text, and where: "disks.mof:3:14: expected ";", found "class"". Lines and columns count from 1,
 // columns in bytes. The status is kZEPStatusInvalidFormat, or why a file cannot be read or the namespace refuses.
 class TMofError : public TZEPException {

@@ -18,8 +18,6 @@ constexpr std::size_t kMostNestedKeys = 8;  // the text of such a path doubles w
 
 const TCIMContext kNone;
 
-std::string NameAt(TMofPlace const& place) { return std::string(place.fText); }
-
 bool IsAlias(TMofValue const& value) { return !value.fIsArray && value.fLiterals.front().fKind == TMofLiteral::kAlias; }
 
 }  // namespace

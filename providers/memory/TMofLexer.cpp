@@ -48,7 +48,7 @@ TMofToken TMofLexer::Next() {
   if (*fNext == '$' && EndOfName(fNext + 1) != fNext + 1) return Take(TMofToken::kAlias, EndOfName(fNext + 1));
   if (*fNext == '#') {
     char const* const end = EndOfName(fNext + 1);
-    if (IsSameName(std::string(fNext, end), "#pragma")) return Take(TMofToken::kPragma, end);
+    if (IsSameName({fNext, static_cast<std::size_t>(end - fNext)}, "#pragma")) return Take(TMofToken::kPragma, end);
   }
   Refuse(fNext + 1, "this character begins nothing that is known here");
 }

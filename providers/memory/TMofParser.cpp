@@ -14,11 +14,6 @@ namespace {
 
 using TType = TCIMValue::TCIMType;
 
-bool IsSameWord(std::string_view a, std::string_view b) {
-  const auto fold = [](char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c; };
-  return a.size() == b.size() && std::equal(a.begin(), a.end(), b.begin(), [&](char x, char y) { return fold(x) == fold(y); });
-}
-
 struct TScopeWord {
   std::string_view fWord;
   unsigned int fScope;
@@ -86,7 +81,7 @@ void TMofParser::ParsePragma() {
   Expect('(');
   const TMofPlace argument = Here();
   const std::string text = ParseString();
-  if (IsSameWord(name.fText, "include")) {
+  if (IsSameName(name.fText, "include")) {
     TMofParser(fDocument, fSources, fSources.OpenIncluded(text, argument)).Parse();
     fSources.CloseIncluded();
   }
@@ -185,10 +180,7 @@ void TMofParser::ParseInstance() {
 TMofQualifiers TMofParser::ParseQualifiers() {
   TMofQualifiers qualifiers;
   if (!Skip('[')) return qualifiers;
-  do qualifiers.push_back(ParseQualifier());
-  while (Skip(','));
-  if (!IsMark(']')) Refuse("\",\" or \"]\"");
-  Advance();
+  ParseListUpTo(']', [&] { qualifiers.push_back(ParseQualifier()); });
   return qualifiers;
 }
 
@@ -210,11 +202,7 @@ TMofFeature TMofParser::ParseFeature() {
   static_cast<TMofParameter&>(feature) = ParseParameter();
   if (Skip('(')) {
     feature.fIsMethod = true;
-    if (!IsMark(')')) do
-        feature.fParameters.push_back(ParseParameter());
-      while (Skip(','));
-    if (!IsMark(')')) Refuse("\",\" or \")\"");
-    Advance();
+    if (!Skip(')')) ParseListUpTo(')', [&] { feature.fParameters.push_back(ParseParameter()); });
   } else if (Skip('='))
     feature.fDefault = ParseValue();
   const bool couldGoOn = !feature.fIsMethod && !feature.fDefault;
@@ -282,11 +270,7 @@ TMofValue TMofParser::ParseArray() {
   value.fPlace = Here();
   value.fIsArray = true;
   Expect('{');
-  if (Skip('}')) return value;
-  do value.fLiterals.push_back(ParseLiteral());
-  while (Skip(','));
-  if (!IsMark('}')) Refuse("\",\" or \"}\"");
-  Advance();
+  if (!Skip('}')) ParseListUpTo('}', [&] { value.fLiterals.push_back(ParseLiteral()); });
   return value;
 }
 
@@ -316,6 +300,14 @@ TMofLiteral TMofParser::ParseLiteral() {
   return literal;
 }
 
+// Items between commas, and the mark behind the last.
+template <class TParseItem>
+void TMofParser::ParseListUpTo(char end, TParseItem const& parseItem) {
+  do parseItem();
+  while (Skip(','));
+  if (!Skip(end)) Refuse(std::string("\",\" or \"") + end + "\"");
+}
+
 // Strings that stand one after another are one.
 std::string TMofParser::ParseString() {
   if (fToken.fKind != TMofToken::kString) Refuse("a string");
@@ -325,7 +317,7 @@ std::string TMofParser::ParseString() {
 }
 
 bool TMofParser::IsWord(std::string_view word) const {
-  return fToken.fKind == TMofToken::kName && IsSameWord(fToken.fText, word);
+  return fToken.fKind == TMofToken::kName && IsSameName(fToken.fText, word);
 }
 
 bool TMofParser::Skip(char mark) {

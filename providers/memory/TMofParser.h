@@ -37,6 +37,8 @@ private:
   TMofValue ParseValue();
   TMofValue ParseArray();
   TMofLiteral ParseLiteral();
+  template <class TParseItem>
+  void ParseListUpTo(char end, TParseItem const& parseItem);
   std::string ParseString();
 
   // ---- Tokens ----

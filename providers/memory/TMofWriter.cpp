@@ -24,8 +24,6 @@ using TStaticValues = std::map<std::string, TCIMValue>;  // by name in small let
 
 const TCIMContext kNone;
 
-[[noreturn]] void ThrowUnprintable() { throw TZEPException(kZEPStatusNotSupported); }
-
 std::vector<std::string> ScopeWords(unsigned int scope) {
   constexpr char const* kWords[] = {"class", "association", "indication", "property", "reference", "method", "parameter"};
   if (scope == ICIMQualifierDecl::kScopeAny) return {"any"};

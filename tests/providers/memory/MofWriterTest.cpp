@@ -247,6 +247,13 @@ TEST(MofWriterTest, WhatMofCannotSayIsRefused) {
        [](TMemoryNamespace& ns) { ns.DefineClass("X_A").Property("P", "real64", std::numeric_limits<double>::infinity()); }},
       {"no number",
        [](TMemoryNamespace& ns) { ns.DefineClass("X_A").Property("P", "real32", std::numeric_limits<float>::quiet_NaN()); }},
+      {"a NULL character",
+       [](TMemoryNamespace& ns) { ns.DefineClass("X_A").Property("P", "char16", TCIMChar16(std::string("A"))); }},
+      {"a NULL character among others",
+       [](TMemoryNamespace& ns) {
+         const std::vector<TCIMValue> characters = {TCIMValue(TCIMChar16(65)), TCIMValue(TCIMChar16(std::string()))};
+         ns.DefineClass("X_A").Property("P", "char16[]", TCIMValue(TType::kCIMTypeChar16, 0, characters));
+       }},
       {"a method that returns a reference",
        [](TMemoryNamespace& ns) { ns.DefineClass("X_A").Method("M", TType::kCIMTypeReference); }},
       {"a parameter that refers to no class",
