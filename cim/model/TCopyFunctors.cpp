@@ -1,5 +1,7 @@
 // The steps of the copy, in the order in which it comes to them.
 
+#include "TCIMCopy.h"
+
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
 #include "ICIMMethodDecl.h"
@@ -10,7 +12,6 @@
 #include "ICIMQualifier.h"
 #include "ICIMQualifierDecl.h"
 #include "TAddToVectorCallback.h"
-#include "TCIMCopy.h"
 #include "TCIMReference.h"
 #include "TZEPException.h"
 #include "core/Log.h"

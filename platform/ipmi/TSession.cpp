@@ -124,8 +124,10 @@ int TSession::Open() {
   int error = IPMI_ERR_INTERNAL_ERROR;
   for (int way = fWayThatWorked; way < kNumberOfWays; way = WayBehind(way, error)) {
     error = TryToOpen(way);
-    if (error == IPMI_ERR_SUCCESS) fWayThatWorked = way;
-    if (error == IPMI_ERR_SUCCESS) break;
+    if (error == IPMI_ERR_SUCCESS) {
+      fWayThatWorked = way;
+      break;
+    }
   }
   return StatusOf(error);
 }
