@@ -1,5 +1,7 @@
 #include "HostRecords.h"
 
+#include "TCIMSchemaHelper.h"
+
 #include <sys/utsname.h>
 
 #include <cstdlib>
@@ -21,10 +23,10 @@ TSystemName SystemNameOf(utsname const& kernel) {
 }
 
 TRecord OperatingSystemRecord(TOsRelease const& release, utsname const& kernel, TSystemName const& name) {
-  TRecord record("QRVSG_OperatingSystem", release.GetFile());
-  record.AddKey("CSCreationClassName", "QRVSG_ComputerSystem");
+  TRecord record(TCIMSchemaHelper::kOperatingSystemCreationClassName, release.GetFile());
+  record.AddKey("CSCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
   record.AddKey("CSName", name.fName);
-  record.AddKey("CreationClassName", "QRVSG_OperatingSystem");
+  record.AddKey("CreationClassName", TCIMSchemaHelper::kOperatingSystemCreationClassName);
   record.AddKey("Name", release.Value({"NAME"}));
   record.Add("Caption", release.Value({"PRETTY_NAME"}));
   record.Add("Version", release.Value({"VERSION", "VERSION_ID", "BUILD_ID"}));

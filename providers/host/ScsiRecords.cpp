@@ -1,5 +1,7 @@
 #include "ScsiRecords.h"
 
+#include "TCIMSchemaHelper.h"
+
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
@@ -84,7 +86,7 @@ TText DeviceTypeFrom(TText const& number) {
 TRecord MakeRecord(TSystemName const& name, TText const& id, TText const& type, TText const& vendor, TText const& product,
                    TText const& revision) {
   TRecord record(kClassName, "sysfs");
-  record.AddKey("SystemCreationClassName", "QRVSG_ComputerSystem");
+  record.AddKey("SystemCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
   record.AddKey("SystemName", name.fName);
   record.AddKey("CreationClassName", kClassName);
   record.AddKey("DeviceID", id);

@@ -2,6 +2,7 @@
 
 #include "Placeholder.h"
 #include "TCIMDateTime.h"
+#include "TCIMSchemaHelper.h"
 #include "TZEPException.h"
 
 #include <algorithm>
@@ -294,8 +295,8 @@ TFinding<std::uint32_t> SpeedOf(TSmbiosStructure const& memoryDevice, std::size_
 }  // namespace
 
 TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name) {
-  TRecord record("QRVSG_ComputerSystem", name.fSource);
-  record.AddKey("CreationClassName", "QRVSG_ComputerSystem");
+  TRecord record(TCIMSchemaHelper::kSystemCreationClassName, name.fSource);
+  record.AddKey("CreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
   record.AddKey("Name", TFinding<std::string>(name.fName));
   record.SetSource(source);
   record.Add("Manufacturer", TextOf(system, 0x04));
@@ -342,7 +343,7 @@ TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source
 
 TRecord ProcessorRecord(TSmbiosStructure const& processor, std::string const& source, unsigned number, TSystemName const& name) {
   TRecord record("CIM_Processor", source);
-  record.AddKey("SystemCreationClassName", "QRVSG_ComputerSystem");
+  record.AddKey("SystemCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
   record.AddKey("SystemName", name.fName);
   record.AddKey("CreationClassName", "CIM_Processor");
   record.AddKey("DeviceID", "Processor " + std::to_string(number));

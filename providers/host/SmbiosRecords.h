@@ -10,13 +10,6 @@ namespace NQRVZEP20 {
 // What SMBIOS structures say, as records of CIM classes: the DMTF's property names, types and numbers. `source` tells where
 // the structure was read. `number` counts the instances of the class, from 0.
 
-// The structure types that are read.
-constexpr int kSmbiosBios = 0;
-constexpr int kSmbiosSystem = 1;
-constexpr int kSmbiosChassis = 3;
-constexpr int kSmbiosProcessor = 4;
-constexpr int kSmbiosMemoryDevice = 17;
-
 TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name);
 TRecord BiosRecord(TSmbiosStructure const& bios, std::string const& source, unsigned number);
 TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source, unsigned number);

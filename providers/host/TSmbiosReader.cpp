@@ -40,15 +40,15 @@ TMissing WhyTablesFailed(int status, std::string const& tableFile) {
 
 char const* NameOf(int type) {
   switch (type) {
-    case 0:
+    case kSmbiosBios:
       return "BIOS Information";
-    case 1:
+    case kSmbiosSystem:
       return "System Information";
-    case 3:
+    case kSmbiosChassis:
       return "Chassis";
-    case 4:
+    case kSmbiosProcessor:
       return "Processor";
-    case 17:
+    case kSmbiosMemoryDevice:
       return "Memory Device";
     default:
       return "other";

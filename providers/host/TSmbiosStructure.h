@@ -9,6 +9,13 @@
 
 namespace NQRVZEP20 {
 
+// The structure types that are read.
+constexpr int kSmbiosBios = 0;
+constexpr int kSmbiosSystem = 1;
+constexpr int kSmbiosChassis = 3;
+constexpr int kSmbiosProcessor = 4;
+constexpr int kSmbiosMemoryDevice = 17;
+
 // One SMBIOS structure: a header of four bytes, the formatted area, and the string set behind it. Whatever the bytes say,
 // nothing outside them is read. Numbers are little-endian; offsets count from the header, as the SMBIOS standard's do.
 class TSmbiosStructure {
