@@ -54,12 +54,18 @@ function(zep_room name)
   target_include_directories(${name} PRIVATE ${PROJECT_SOURCE_DIR}/include ${PROJECT_SOURCE_DIR})
 endfunction()
 
-# A library that is loaded at run time and lies beside libzepcore.so under exactly the name given.
+# A library that is loaded at run time and lies beside libzepcore.so under exactly the name given. MAP: the list of what it
+# exports, when that is not all that its sources mark.
 function(zep_loaded_library name file)
-  add_library(${name} MODULE ${ARGN})
+  cmake_parse_arguments(ARG "" "MAP" "" ${ARGN})
+  add_library(${name} MODULE ${ARG_UNPARSED_ARGUMENTS})
   target_link_libraries(${name} PRIVATE zep_options)
   set_target_properties(${name} PROPERTIES PREFIX "" OUTPUT_NAME ${file} SUFFIX ""
     LIBRARY_OUTPUT_DIRECTORY ${ZEP_LIB_DIR} BUILD_RPATH "$ORIGIN" INSTALL_RPATH "$ORIGIN" BUILD_WITH_INSTALL_RPATH ON)
+  if(ARG_MAP)
+    target_link_options(${name} PRIVATE LINKER:--version-script=${CMAKE_CURRENT_SOURCE_DIR}/${ARG_MAP})
+    set_target_properties(${name} PROPERTIES LINK_DEPENDS ${CMAKE_CURRENT_SOURCE_DIR}/${ARG_MAP})
+  endif()
 endfunction()
 
 # A test program of GoogleTest; each of its tests becomes one of ctest's. LIBS are linked, the library always.

@@ -21,7 +21,6 @@
 namespace NQRVZEP20 {
 namespace {
 
-std::string const gFileSeparator = "/";  // the logger's own operations do not use it
 std::string const gDefaultLogFileDir = "/var/log/QRV_Support/ZepDebugLog/";
 
 }  // namespace
