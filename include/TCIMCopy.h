@@ -77,24 +77,25 @@ private:
 // A class and all below it, as TCopyClass copies each.
 class ZEP_EXPORT TCopyClassTree {
 public:
-  TCopyClassTree(boost::weak_ptr<NQRVZEP20::ICIMNamespace> destination, bool pass, bool noProductInstances);
+  TCopyClassTree(boost::weak_ptr<NQRVZEP20::ICIMNamespace> destination, bool associations, bool noProductInstances);
   bool operator()(boost::shared_ptr<NQRVZEP20::ICIMClass> cls);
 
 private:
   boost::weak_ptr<NQRVZEP20::ICIMNamespace> fDestination;
-  bool fPass;
+  bool fAssociations;
   bool fNoProductInstances;
 };
 
-// A class whose flag equals `pass`, with its instances when it is the product class; any other class is passed over.
+// A class whose flag (ICIMClass::GetClassFlag, set for associations) equals `associations`, with its instances when it is the
+// product class; any other class is passed over.
 class ZEP_EXPORT TCopyClass {
 public:
-  TCopyClass(boost::weak_ptr<NQRVZEP20::ICIMNamespace> destination, bool pass, bool noProductInstances);
+  TCopyClass(boost::weak_ptr<NQRVZEP20::ICIMNamespace> destination, bool associations, bool noProductInstances);
   bool operator()(boost::shared_ptr<NQRVZEP20::ICIMClass> cls);
 
 private:
   boost::weak_ptr<NQRVZEP20::ICIMNamespace> fDestination;
-  bool fPass;
+  bool fAssociations;
   bool fNoProductInstances;
 };
 

@@ -18,6 +18,8 @@ namespace {
 
 using TType = TCIMValue::TCIMType;
 
+constexpr bool kPlainClasses = false, kAssociations = true;
+
 // The class of that name. A namespace may answer an unknown name with an empty pointer, too.
 boost::shared_ptr<ICIMClass> ClassIn(ICIMNamespace const& dst, std::string const& name) {
   const boost::shared_ptr<ICIMClass> cls = dst.GetClass(name, TCIMContext());
@@ -82,8 +84,8 @@ bool IsArrayOfReferences(TCIMValue const& v) {
 
 void TCIMCopy::CopyClasses(boost::shared_ptr<ICIMNamespace> src, boost::shared_ptr<ICIMNamespace> dst, bool noProductInstances) {
   src->EnumerateQualifierDecls(TCopyQualifierDecls(dst), TCIMContext());
-  src->EnumerateClasses(TCopyClassTree(dst, false, noProductInstances), TCIMContext());
-  src->EnumerateClasses(TCopyClassTree(dst, true, noProductInstances), TCIMContext());
+  src->EnumerateClasses(TCopyClassTree(dst, kPlainClasses, noProductInstances), TCIMContext());
+  src->EnumerateClasses(TCopyClassTree(dst, kAssociations, noProductInstances), TCIMContext());
 }
 
 void TCIMCopy::CopyClass(boost::shared_ptr<ICIMClass> cls, boost::shared_ptr<ICIMNamespace> dst) {

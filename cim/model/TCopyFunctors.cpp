@@ -78,21 +78,21 @@ bool TCopyQualifierDecls::operator()(boost::shared_ptr<ICIMQualifierDecl> declar
 
 // ---- Classes ----
 
-TCopyClassTree::TCopyClassTree(boost::weak_ptr<ICIMNamespace> destination, bool pass, bool noProductInstances)
-    : fDestination(destination), fPass(pass), fNoProductInstances(noProductInstances) {}
+TCopyClassTree::TCopyClassTree(boost::weak_ptr<ICIMNamespace> destination, bool associations, bool noProductInstances)
+    : fDestination(destination), fAssociations(associations), fNoProductInstances(noProductInstances) {}
 
 bool TCopyClassTree::operator()(boost::shared_ptr<ICIMClass> cls) {
-  TCopyClass copyClass(Lock(fDestination), fPass, fNoProductInstances);
+  TCopyClass copyClass(Lock(fDestination), fAssociations, fNoProductInstances);
   copyClass(cls);
   cls->EnumerateSubClasses(copyClass, TCIMContext());
   return true;
 }
 
-TCopyClass::TCopyClass(boost::weak_ptr<ICIMNamespace> destination, bool pass, bool noProductInstances)
-    : fDestination(destination), fPass(pass), fNoProductInstances(noProductInstances) {}
+TCopyClass::TCopyClass(boost::weak_ptr<ICIMNamespace> destination, bool associations, bool noProductInstances)
+    : fDestination(destination), fAssociations(associations), fNoProductInstances(noProductInstances) {}
 
 bool TCopyClass::operator()(boost::shared_ptr<ICIMClass> cls) {
-  if (cls->GetClassFlag(TCIMContext()) != fPass) return true;
+  if (cls->GetClassFlag(TCIMContext()) != fAssociations) return true;
   TCIMCopy::CopyClass(cls, Lock(fDestination));
   if (!HasProductInstances(*cls)) return true;
 

@@ -30,7 +30,7 @@ TNamespaceProviderManager::~TNamespaceProviderManager() = default;
 
 void TNamespaceProviderManager::RegisterNamespaceProvider(boost::shared_ptr<INamespaceProvider> provider) {
   std::string const& name = provider->GetName(TCIMContext());
-  fProviders.emplace(name, provider);  // the first provider of a name stays. Kept quiet.
+  fProviders.emplace(name, provider);  // the first provider of a name stays, without a word. Kept.
 }
 
 boost::shared_ptr<INamespaceProvider> TNamespaceProviderManager::GetNamespaceProvider(std::string const& name) const {
