@@ -27,11 +27,9 @@ std::string IIPMILan::m_LANMapping[MAXMULTINODE] = {
 
 namespace {
 
-// Where the parts of a message lie, counted from its first byte.
-constexpr std::ptrdiff_t kCompletionCode = 6;
-
-constexpr std::ptrdiff_t kAuthenticationType = 4;
-constexpr std::ptrdiff_t kAuthenticationCodeSize = 16;
+constexpr std::ptrdiff_t kCompletionCode = 6;           // its place in a message
+constexpr std::ptrdiff_t kAuthenticationType = 4;       // its place in a packet
+constexpr std::ptrdiff_t kAuthenticationCodeSize = 16;  // bytes, between the session header and the length
 
 bool HasEntry(int node) { return node >= 0 && node < IIPMILan::MAXMULTINODE; }
 

@@ -39,6 +39,12 @@ constexpr int kBindPauseSeconds = 3;
 constexpr int kCommandSilenceSeconds = 300;
 constexpr std::size_t kHardwareAddressSize = 6;
 
+// Where the fields of a DHCP message lie.
+constexpr std::size_t kXidOffset = 4;
+constexpr std::size_t kCiaddrOffset = 12;
+constexpr std::size_t kChaddrOffset = 28;
+constexpr std::size_t kMagicCookieOffset = 236;
+
 // ---- Texts and commands ----
 
 bool BeginsWith(std::string_view text, std::string_view beginning) { return text.substr(0, beginning.size()) == beginning; }
@@ -258,7 +264,7 @@ void AutoProxyDiscovery::wpadPreconfig() {
 unsigned char* AutoProxyDiscovery::make_message(std::string const& address, std::string const& hardwareAddress,
                                                 unsigned char*& message) {
   constexpr unsigned char kHead[] = {1, 1, kHardwareAddressSize, 0};  // a request, over Ethernet, with its address size, no hops
-  constexpr std::uint32_t kTransaction = 1983;                        // in the machine's byte order, and always the same. Kept.
+  constexpr std::uint32_t kXid = 1983;                                // in the machine's byte order, and always the same. Kept.
   constexpr unsigned char kOptions[] = {0x63, 0x82, 0x53, 0x63,       // the magic cookie
                                         0x35, 0x01, 0x08,             // the kind of message: DHCPINFORM
                                         0x37, 0x01, 0xfc,             // asked for: option 252
@@ -267,10 +273,10 @@ unsigned char* AutoProxyDiscovery::make_message(std::string const& address, std:
   if (message == nullptr) return nullptr;
   std::uint32_t const ciaddr = GetCiaddr(address);
   std::memcpy(message, kHead, sizeof kHead);
-  std::memcpy(message + 4, &kTransaction, sizeof kTransaction);
-  std::memcpy(message + 12, &ciaddr, sizeof ciaddr);
-  GetChaddr(hardwareAddress, message + 28);
-  std::memcpy(message + 236, kOptions, sizeof kOptions);
+  std::memcpy(message + kXidOffset, &kXid, sizeof kXid);
+  std::memcpy(message + kCiaddrOffset, &ciaddr, sizeof ciaddr);
+  GetChaddr(hardwareAddress, message + kChaddrOffset);
+  std::memcpy(message + kMagicCookieOffset, kOptions, sizeof kOptions);
   return message;
 }
 
@@ -327,17 +333,17 @@ int AutoProxyDiscovery::open_send_socket() {
 }
 
 int AutoProxyDiscovery::open_recv_socket(char*) {
-  int const receiver = ::socket(AF_INET, SOCK_DGRAM, 0);
-  if (receiver < 0) {
+  TUniqueFd receiver(::socket(AF_INET, SOCK_DGRAM, 0));
+  if (!receiver) {
     LogDebug("setup socket failed!");
     return -1;
   }
-  for (int attempt = 1; !BindTo(receiver, AddressOf(INADDR_ANY, kClientPort)); ++attempt) {
+  for (int attempt = 1; !BindTo(receiver.get(), AddressOf(INADDR_ANY, kClientPort)); ++attempt) {
     LogDebug("bind to DHCP_CLIENT_PORT failed!");
     if (attempt == kBindAttempts) break;  // and the socket has no port. Kept.
     ::sleep(kBindPauseSeconds);
   }
-  return receiver;
+  return receiver.release();
 }
 
 long AutoProxyDiscovery::send_packet(int socket, unsigned char const* bytes, long size) {
