@@ -1,9 +1,8 @@
 #include "os/LocalTime.h"
 
-#include <time.h>
+#include "core/TimeZone.h"
 
-#include <cstdlib>
-#include <cstring>
+#include <time.h>
 
 namespace NQRVZEP20 {
 namespace {
@@ -16,23 +15,12 @@ short UTCOffsetOf(std::tm const& fields) {
 
 }  // namespace
 
-// What the thread broke down last, and for which text of TZ. The logger reads the time several times a line, and to break a
-// second down goes to the file system. Without a destructor, so that it serves a thread to its very end.
-struct TLocalClock::TMemory {
-  bool fHoldsZone;  // of a text of TZ that fits below, or of no TZ
-  bool fHoldsTime;
-  bool fHasZone;
-  char fZone[64];
-  TLocalTime fLast;
-
-  bool IsOfZone(char const* zone) const { return fHoldsZone && (zone ? fHasZone && std::strcmp(fZone, zone) == 0 : !fHasZone); }
-
-  void SetZone(char const* zone) {
-    fHoldsTime = false;
-    fHasZone = zone != nullptr;
-    fHoldsZone = !fHasZone || std::strlen(zone) < sizeof fZone;
-    if (fHasZone && fHoldsZone) std::strcpy(fZone, zone);
-  }
+// What the thread broke down last. The logger reads the time several times a line, and to break a second down goes to the
+// file system. Without a destructor, so that it serves a thread to its very end.
+struct TLocalClock::TCache {
+  TTimeZone fZone;
+  bool fHoldsTime = false;
+  TLocalTime fLast{};
 
   void BreakDown(std::time_t time) {
     ::tzset();  // localtime_r alone would not look at TZ again
@@ -43,19 +31,18 @@ struct TLocalClock::TMemory {
   }
 };
 
-thread_local TLocalClock::TMemory TLocalClock::fgMemory;
+thread_local TLocalClock::TCache TLocalClock::fgCache;
 
-TLocalClock::TLocalClock() : fMemory(fgMemory) {
-  char const* const zone = std::getenv("TZ");
-  if (!fMemory.IsOfZone(zone)) fMemory.SetZone(zone);
+TLocalClock::TLocalClock() : fCache(fgCache) {
+  if (fCache.fZone.HasChanged()) fCache.fHoldsTime = false;
 }
 
 TLocalTime const& TLocalClock::Now() {
   timespec now;
   ::clock_gettime(CLOCK_REALTIME, &now);
-  if (!fMemory.fHoldsTime || fMemory.fLast.fTime != now.tv_sec) fMemory.BreakDown(now.tv_sec);
-  fMemory.fLast.fMilliseconds = static_cast<unsigned int>(now.tv_nsec / 1000000);
-  return fMemory.fLast;
+  if (!fCache.fHoldsTime || fCache.fLast.fTime != now.tv_sec) fCache.BreakDown(now.tv_sec);
+  fCache.fLast.fMilliseconds = static_cast<unsigned int>(now.tv_nsec / 1000000);
+  return fCache.fLast;
 }
 
 }  // namespace NQRVZEP20

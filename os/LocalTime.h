@@ -21,10 +21,10 @@ public:
   TLocalTime const& Now();
 
 private:
-  struct TMemory;
-  static thread_local TMemory fgMemory;
+  struct TCache;
+  static thread_local TCache fgCache;
 
-  TMemory& fMemory;  // this thread's
+  TCache& fCache;  // this thread's
 };
 
 }  // namespace NQRVZEP20

@@ -1,11 +1,11 @@
 #include "TCIMDateTimeImpl.h"
 
 #include "TZEPException.h"
+#include "core/TimeZone.h"
 
 #include <climits>
 #include <cstdlib>
 #include <ctime>
-#include <functional>
 #include <string_view>
 
 namespace NQRVZEP20 {
@@ -35,15 +35,10 @@ std::tm RecordOf(unsigned short year, unsigned short month, unsigned int day, un
   return record;
 }
 
-// localtime_r looks at TZ once, mktime whenever it is called.
+// For localtime_r, which looks at TZ once.
 void LookAtZone() {
-  constexpr std::size_t kNoZone = 0;
-  static thread_local std::size_t zoneSeen = kNoZone;
-  char const* const zone = std::getenv("TZ");
-  std::size_t const hash = zone ? std::hash<std::string_view>()(zone) | 1 : kNoZone;
-  if (hash == zoneSeen) return;
-  ::tzset();
-  zoneSeen = hash;
+  static thread_local TTimeZone zone;
+  if (zone.HasChanged()) ::tzset();
 }
 
 // Whether such a local time has been, or will be, in standard time.
