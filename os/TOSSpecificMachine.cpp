@@ -46,39 +46,60 @@ void LogIdentity(std::string const& productDescription, TMachineIdentity const& 
   LogDebug(identity.model);
 }
 
-enum class EIdentityLog { kTypeOnly, kAll };
-
-// Reads SMBIOS type 1, for GetMachineType and GetMachineInfo alike: the messages of both name the former.
-TMachineIdentity ReadMachineIdentity(EIdentityLog logged) {
-  TMachineIdentity identity;
-  TSmbiosTables tables;
+bool AreOpen(TSmbiosTables const& tables) {
   if (tables.OpenStatus() != kZEPStatusOK) {
     LogDebug("getMachineType: Unable to open SMBIOS lib error = ", tables.OpenStatus());
-    return identity;
+    return false;
   }
   if (!tables.HasHandle()) {
     LogDebug("Unable to read machine type from SMBIOS. Invalid Handle was encountered.");
-    return identity;
+    return false;
   }
-  constexpr int kBufferSize = 1024;
-  const std::unique_ptr<char[]> buffer = NewClearedBuffer(kBufferSize);
-  if (!buffer) {
-    LogDebug("Unable to allocate memory to hold machineType");
-    return identity;
-  }
-  int length = 0;
-  if (tables.GetFirst(kSystemInformation, buffer.get(), kBufferSize, length) != kZEPStatusOK || length < 1) {
-    LogDebug("Unable to read DMI structure type 1 from SMBIOS");
-    return identity;
-  }
+  return true;
+}
 
-  const TStructureStrings strings({buffer.get(), static_cast<std::size_t>(length)});
+struct TStructure {
+  std::unique_ptr<char[]> fBuffer;  // null when it could not be read
+  int fLength = 0;
+
+  std::string_view Bytes() const { return {fBuffer.get(), static_cast<std::size_t>(fLength)}; }
+};
+
+TStructure ReadSystemInformation(TSmbiosTables& tables) {
+  constexpr int kBufferSize = 1024;
+  TStructure structure{NewClearedBuffer(kBufferSize)};
+  if (!structure.fBuffer) {
+    LogDebug("Unable to allocate memory to hold machineType");
+    return {};
+  }
+  const int status = tables.GetFirst(kSystemInformation, structure.fBuffer.get(), kBufferSize, structure.fLength);
+  if (status != kZEPStatusOK || structure.fLength < 1) {
+    LogDebug("Unable to read DMI structure type 1 from SMBIOS");
+    return {};
+  }
+  return structure;
+}
+
+enum class EIdentityLog { kTypeOnly, kAll };
+
+TMachineIdentity IdentityIn(std::string_view systemInformation, EIdentityLog logged) {
+  TMachineIdentity identity;
+  const TStructureStrings strings(systemInformation);
   const std::string productDescription(strings.NamedAt(kProductName).value_or(""));
   ReadProductDescription(productDescription, identity);
   if (logged == EIdentityLog::kAll) LogIdentity(productDescription, identity);
   if (const std::optional<std::string_view> number = strings.NamedAt(kSerialNumber)) identity.serialNumber = *number;
-
   LogDebug("Machine type detected: ", identity.type);
+  return identity;
+}
+
+// Reads SMBIOS type 1, for GetMachineType and GetMachineInfo alike: the messages of both name the former.
+TMachineIdentity ReadMachineIdentity(EIdentityLog logged) {
+  TSmbiosTables tables;
+  if (!AreOpen(tables)) return {};
+  const TStructure structure = ReadSystemInformation(tables);
+  if (!structure.fBuffer) return {};
+  const TMachineIdentity identity = IdentityIn(structure.Bytes(), logged);
   tables.Close();
   LogDebug("getMachineType() completed.");
   return identity;
@@ -112,31 +133,43 @@ std::string BiosVersionIn(char* buffer) {
   return CleanBiosVersion(version);
 }
 
-// The cleaned BIOS version of SMBIOS type 0, empty when the read failed. Nothing when the tables cannot be opened or hold
-// no such structure. The tables stay open with `tables`.
-std::optional<std::string> ReadBiosVersion(std::optional<TSmbiosTables>& tables, TBiosVersionMessages const& messages) {
-  constexpr int kBufferSize = 4096;
-  const std::unique_ptr<char[]> buffer = NewClearedBuffer(kBufferSize);
-  if (buffer) tables.emplace();
-  const int openStatus = tables ? tables->OpenStatus() : kZEPStatusOutOfMemory;
-  if (openStatus != kZEPStatusOK) {
-    LogDebug(messages.unableToOpen, openStatus);
-    return std::nullopt;
+// Reads the BIOS version of SMBIOS type 0. The tables stay open while it lives, because the callers tell what they made of
+// the version before the tables are closed.
+class TBiosVersionReader {
+public:
+  explicit TBiosVersionReader(TBiosVersionMessages const& messages) : fMessages(messages) {
+    if (fBuffer) fTables.emplace();  // without memory they are not opened
   }
 
-  LogDebug(messages.retrieving);
-  int length = 0;
-  const int status = tables->GetFirst(kBiosInformation, buffer.get(), kBufferSize, length);
-  if (status == kZEPStatusFail) {
-    LogDebug(messages.readFailed);
-    return std::string();
+  // The cleaned version, empty when the read failed. Nothing when the tables cannot be opened or hold no such structure.
+  std::optional<std::string> Read() {
+    const int openStatus = fTables ? fTables->OpenStatus() : kZEPStatusOutOfMemory;
+    if (openStatus != kZEPStatusOK) {
+      LogDebug(fMessages.unableToOpen, openStatus);
+      return std::nullopt;
+    }
+
+    LogDebug(fMessages.retrieving);
+    int length = 0;
+    const int status = fTables->GetFirst(kBiosInformation, fBuffer.get(), kBufferSize, length);
+    if (status == kZEPStatusFail) {
+      LogDebug(fMessages.readFailed);
+      return std::string();
+    }
+    if (status == kZEPStatusNoMoreItems) {
+      LogDebug(fMessages.noMoreItems);
+      return std::nullopt;
+    }
+    return BiosVersionIn(fBuffer.get());
   }
-  if (status == kZEPStatusNoMoreItems) {
-    LogDebug(messages.noMoreItems);
-    return std::nullopt;
-  }
-  return BiosVersionIn(buffer.get());
-}
+
+private:
+  static constexpr int kBufferSize = 4096;
+
+  TBiosVersionMessages const& fMessages;
+  std::unique_ptr<char[]> const fBuffer = NewClearedBuffer(kBufferSize);
+  std::optional<TSmbiosTables> fTables;
+};
 
 std::string LowerCase(std::string text) {
   for (char& c : text)
@@ -230,8 +263,8 @@ std::string TOSSpecific::GetMachineType() {
 
 std::string TOSSpecific::GetMachineTypeFromID() {
   const std::string type = GetMachineType();
-  std::optional<TSmbiosTables> tables;
-  if (const std::optional<std::string> version = ReadBiosVersion(tables, kGetMachineTypeFromIDMessages)) {
+  TBiosVersionReader bios(kGetMachineTypeFromIDMessages);
+  if (const std::optional<std::string> version = bios.Read()) {
     const std::string buildNumber = LowerCase(*version);
     LogDebug("TOSSpecific::GetMachineTypeFromID - buildNumber is ", buildNumber);
     if (const std::optional<std::string> typeOfBuild = MachineTypeOfBuild(buildNumber)) {
@@ -244,8 +277,8 @@ std::string TOSSpecific::GetMachineTypeFromID() {
 }
 
 std::string TOSSpecific::GetBiosID() {
-  std::optional<TSmbiosTables> tables;
-  const std::optional<std::string> version = ReadBiosVersion(tables, kGetBiosIDMessages);
+  TBiosVersionReader bios(kGetBiosIDMessages);
+  const std::optional<std::string> version = bios.Read();
   if (!version) return kNoBiosID;
   const std::string biosID = version->empty() ? kNoBiosID : version->substr(0, 2);
   LogDebug("TOSSpecific::GetBiosID - biosID = ", biosID);
