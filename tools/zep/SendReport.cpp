@@ -5,10 +5,8 @@
 #include "Text.h"
 
 #include <stdlib.h>
-#include <unistd.h>
 
 #include <cerrno>
-#include <ctime>
 #include <filesystem>
 #include <fstream>
 #include <iostream>
@@ -19,20 +17,6 @@ namespace NQRVZEP20::zep {
 namespace {
 
 namespace fs = std::filesystem;
-
-std::string HostName() {
-  char name[256] = "";
-  ::gethostname(name, sizeof name - 1);
-  return name[0] == '\0' ? "unknown" : name;
-}
-
-std::string FileName() {
-  std::time_t const now = std::time(nullptr);
-  std::tm fields{};
-  char time[32];
-  std::strftime(time, sizeof time, "%Y%m%dT%H%M%SZ", ::gmtime_r(&now, &fields));
-  return "zep-report-" + HostName() + "-" + time + ".json";
-}
 
 std::string MakeDirectory() {
   std::string pattern = (fs::temp_directory_path() / "zep-report.XXXXXX").string();
@@ -77,7 +61,7 @@ TTransferred SendOrSayWhereItIsKept(std::string const& file, TTarget const& targ
 }  // namespace
 
 EExitStatus SendReport(TReport const& report, TTarget const& target, TTransferOptions const& options) {
-  std::string const directory = MakeDirectory(), file = directory + "/" + FileName();
+  std::string const directory = MakeDirectory(), file = directory + "/" + ReportFileName(report, ".json");
   WriteReport(report, file);
   TTransferred const sent = SendOrSayWhereItIsKept(Packed(file), target, options);
   if (sent.fOutcome.fExit != kExitComplete) return sent.fOutcome.fExit;
