@@ -1,5 +1,6 @@
 #include "Transfer.h"
 
+#include "Descriptor.h"
 #include "Failure.h"
 #include "Output.h"
 #include "Sha256.h"
@@ -135,9 +136,7 @@ public:
     while (Open() && !IsStillThere()) Close();  // the one that had it has just removed it
   }
   ~TLockFile() {
-    if (fFile < 0) return;
-    ::unlink(fPath.c_str());
-    Close();
+    if (fFile) ::unlink(fPath.c_str());
   }
   TLockFile(TLockFile const&) = delete;
   TLockFile& operator=(TLockFile const&) = delete;
@@ -146,23 +145,20 @@ public:
 
 private:
   bool Open() {
-    fFile = ::open(fPath.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0666);
-    if (fFile >= 0 && ::flock(fFile, LOCK_EX | LOCK_NB) == 0) return true;
+    fFile = TDescriptor(::open(fPath.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0666));
+    if (fFile && ::flock(fFile.Get(), LOCK_EX | LOCK_NB) == 0) return true;
     fWhyNotHad = errno == EWOULDBLOCK ? "another transfer into the file goes on" : ReasonOf(errno);
     Close();
     return false;
   }
-  void Close() {
-    if (fFile >= 0) ::close(fFile);
-    fFile = -1;
-  }
+  void Close() { fFile = TDescriptor(); }
   bool IsStillThere() const {
     struct stat held, named;
-    return ::fstat(fFile, &held) == 0 && ::stat(fPath.c_str(), &named) == 0 && IsSameFile(held, named);
+    return ::fstat(fFile.Get(), &held) == 0 && ::stat(fPath.c_str(), &named) == 0 && IsSameFile(held, named);
   }
 
   std::string fPath, fWhyNotHad;
-  int fFile = -1;
+  TDescriptor fFile;
 };
 
 // The library asks about a file that is in the way, which can only be one that somebody else has made just now: it meets the
@@ -182,23 +178,20 @@ bool Rename(std::string const& from, std::string const& to, bool overwrites) {
 }
 
 bool MakeEmptyFile(std::string const& path) {
-  int const file = ::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL, 0666);
-  return file >= 0 && ::close(file) == 0;
+  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL, 0666));
+  return static_cast<bool>(file);
 }
 
 // Whether more could be written to the file. False, with errno set, on a full disk.
 bool CanGrow(std::string const& path) {
-  int const file = ::open(path.c_str(), O_WRONLY | O_APPEND);
-  if (file < 0) return errno == ENOENT;
-  off_t const size = ::lseek(file, 0, SEEK_END);
-  char const block[4096] = "";
-  errno = ENOSPC;  // for a write that is cut short
-  bool const isWritten = ::write(file, block, sizeof block) == static_cast<ssize_t>(sizeof block);
+  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_APPEND));
+  if (!file) return errno == ENOENT;
+  off_t const size = ::lseek(file.Get(), 0, SEEK_END);
+  bool const isWritten = WriteWhole(file.Get(), std::string(4096, '\0'));
   int const error = errno;
-  bool const isAsBefore = ::ftruncate(file, size) == 0;
-  ::close(file);
+  if (::ftruncate(file.Get(), size) != 0) return false;
   errno = error;
-  return isWritten && isAsBefore;
+  return isWritten;
 }
 
 // Makes a failed transfer one of the local disk, when that is the cause.
