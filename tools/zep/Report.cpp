@@ -7,6 +7,7 @@
 #include "Sample.h"
 #include "TCIMSchemaHelper.h"
 #include "TZEPException.h"
+#include "Text.h"
 
 #include <algorithm>
 #include <cstdio>
@@ -141,13 +142,6 @@ TAnswer Processors(TNamespaceView const& view) {
   return TAnswer::Known(text, source);
 }
 
-std::string AsSize(unsigned long bytes) {
-  constexpr char const* units[] = {"bytes", "KiB", "MiB", "GiB", "TiB"};
-  std::size_t unit = 0;
-  for (; unit + 1 < std::size(units) && bytes >= 1024 && bytes % 1024 == 0; ++unit) bytes /= 1024;
-  return std::to_string(bytes) + " " + units[unit];
-}
-
 // "128 GiB in 8 modules"
 TAnswer Memory(TNamespaceView const& view) {
   auto const modules = view.InstancesOf("CIM_PhysicalMemory");
@@ -162,7 +156,8 @@ TAnswer Memory(TNamespaceView const& view) {
       ++unknown;
   }
   if (unknown == modules.size()) return capacity;
-  std::string text = AsSize(bytes) + " in " + std::to_string(modules.size()) + (modules.size() == 1 ? " module" : " modules");
+  std::string text =
+      ExactSizeText(bytes) + " in " + std::to_string(modules.size()) + (modules.size() == 1 ? " module" : " modules");
   if (unknown > 0) text += ", " + std::to_string(unknown) + " of them of unknown size";
   return TAnswer::Known(text, capacity.fSource);
 }

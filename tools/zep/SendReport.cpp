@@ -1,13 +1,11 @@
 #include "SendReport.h"
 
 #include "TOSSpecific.h"
+#include "TScratchDirectory.h"
 #include "TZEPException.h"
 #include "Text.h"
 
-#include <stdlib.h>
-
 #include <cerrno>
-#include <filesystem>
 #include <fstream>
 #include <iostream>
 #include <system_error>
@@ -15,14 +13,6 @@
 namespace NQRVZEP20::zep {
 
 namespace {
-
-namespace fs = std::filesystem;
-
-std::string MakeDirectory() {
-  std::string pattern = (fs::temp_directory_path() / "zep-report.XXXXXX").string();
-  if (::mkdtemp(pattern.data()) == nullptr) throw std::system_error(errno, std::generic_category(), "no temporary directory");
-  return pattern;
-}
 
 void WriteReport(TReport const& report, std::string const& file) {
   std::ofstream stream(file);
@@ -43,17 +33,21 @@ std::string Packed(std::string const& file) {
   return file;
 }
 
-void SayWhereItIsKept(std::string const& file) { std::cerr << "zep: the report is kept in " << Printable(file) << "\n"; }
+void KeepAndSayWhere(std::string const& file, TScratchDirectory& directory) {
+  directory.Keep();
+  std::cerr << "zep: the report is kept in " << Printable(file) << "\n";
+}
 
-TTransferred SendOrSayWhereItIsKept(std::string const& file, TTarget const& target, TTransferOptions const& options) {
+TTransferred SendOrKeep(std::string const& file, TScratchDirectory& directory, TTarget const& target,
+                        TTransferOptions const& options) {
   try {
     TTransferred const sent = SendFile(file, target, "", options);
     if (sent.fOutcome.fExit == kExitComplete) return sent;
     std::cerr << "zep: " << sent.fUrl << ": " << sent.fOutcome.fReason << "\n";
-    SayWhereItIsKept(file);
+    KeepAndSayWhere(file, directory);
     return sent;
   } catch (...) {
-    SayWhereItIsKept(file);
+    KeepAndSayWhere(file, directory);
     throw;
   }
 }
@@ -61,14 +55,13 @@ TTransferred SendOrSayWhereItIsKept(std::string const& file, TTarget const& targ
 }  // namespace
 
 EExitStatus SendReport(TReport const& report, TTarget const& target, TTransferOptions const& options) {
-  std::string const directory = MakeDirectory(), file = directory + "/" + ReportFileName(report, ".json");
+  TScratchDirectory directory("zep-report");
+  std::string const file = directory.Path(ReportFileName(report, ".json"));
   WriteReport(report, file);
-  TTransferred const sent = SendOrSayWhereItIsKept(Packed(file), target, options);
+  TTransferred const sent = SendOrKeep(Packed(file), directory, target, options);
   if (sent.fOutcome.fExit != kExitComplete) return sent.fOutcome.fExit;
   if (!options.fQuiet)
     std::cerr << "zep: sent to " << sent.fUrl << ": " << sent.fBytes << " bytes, SHA-256 " << sent.fSha256 << "\n";
-  std::error_code ignored;
-  fs::remove_all(directory, ignored);
   return report.fStatus;
 }
 

@@ -31,16 +31,6 @@ std::string ReasonOf(int error) { return std::generic_category().message(error);
 
 // ---- Progress ----
 
-std::string SizeText(std::uint64_t bytes) {
-  char const* const units[] = {"B", "KiB", "MiB", "GiB", "TiB"};
-  double size = static_cast<double>(bytes);
-  std::size_t unit = 0;
-  for (; size >= 1024 && unit < 4; ++unit) size /= 1024;
-  char text[32];
-  std::snprintf(text, sizeof text, unit == 0 ? "%.0f %s" : "%.1f %s", size, units[unit]);
-  return text;
-}
-
 // One line on the terminal of standard error, written over and over, and gone at the end.
 class TProgress {
 public:

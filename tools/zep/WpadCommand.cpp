@@ -36,7 +36,7 @@ struct TFindings {
   std::optional<TPacFile> fPacFile;  // when it was asked for and there is a URL
 
   bool IsComplete() const { return !fSearch.fUrl.empty() && (!fPacFile || fPacFile->fFailure.empty()); }
-  int ExitStatus() const { return fSearch.fUrl.empty() ? kExitNothing : IsComplete() ? kExitComplete : kExitPartial; }
+  EExitStatus ExitStatus() const { return fSearch.fUrl.empty() ? kExitNothing : IsComplete() ? kExitComplete : kExitPartial; }
 };
 
 // ---- Before the start ----
@@ -132,8 +132,6 @@ std::string AsText(TFindings const& findings) {
   return text;
 }
 
-TJson OrNull(std::string const& text) { return text.empty() ? TJson(nullptr) : TJson(text); }
-
 TJson AskingAsJson(TAsking const& asking) {
   TJson json = {{"interface", OrNull(asking.fInterface)}};
   json["up"] = asking.fInterface.empty() ? TJson(nullptr) : TJson(asking.fIsUp);
@@ -153,9 +151,8 @@ TJson AskingAsJson(TAsking const& asking) {
 
 std::string AsJson(TFindings const& findings) {
   TJson document = DocumentHead("zep wpad");
-  char const* const statusNames[] = {"complete", "nothing", "partial"};
-  document["status"] = statusNames[findings.ExitStatus()];
-  document["exitStatus"] = findings.ExitStatus();
+  document["status"] = NameOf(findings.ExitStatus());
+  document["exitStatus"] = static_cast<int>(findings.ExitStatus());
   document["url"] = OrNull(findings.fSearch.fUrl);
   document["stoppedClients"] = findings.fStoppedClients;
   document["messageBytes"] = AutoProxyDiscovery::kMessageSize;

@@ -298,7 +298,7 @@ TEST_F(ZepTransferTest, AFullDiskIsNamed) {
   });
   EXPECT_THAT(outcome, testing::StartsWith("73zep: ftp://zep@"));
   EXPECT_THAT(outcome,
-              HasSubstr("No space left on device; the 64.0 KiB that arrived are in " + dir_.Path("small/f.part") + "\n"));
+              HasSubstr("No space left on device; the 64 KiB that arrived are in " + dir_.Path("small/f.part") + "\n"));
   EXPECT_THAT(outcome, Not(HasSubstr("looks complete")));
 }
 
