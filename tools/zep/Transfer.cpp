@@ -198,6 +198,37 @@ std::string PartText(std::string const& part) {
   return absent ? "; nothing arrived" : "; the " + SizeText(size) + " that arrived are in " + Printable(part);
 }
 
+// A part that an earlier transfer left goes: the library would ask what is to become of it. False, with errno set, when no new
+// one could be made.
+bool MakeRoomFor(std::string const& part) {
+  if (::unlink(part.c_str()) != 0 && errno != ENOENT) return false;
+  if (!MakeEmptyFile(part)) return false;
+  ::unlink(part.c_str());
+  return true;
+}
+
+TTransferred BrokenOff(TTransferred transferred) {
+  std::string const& part = transferred.fFile;
+  if (transferred.fOutcome.fStatus == kZEPStatusAlreadyExists)
+    return Failed(transferred, kExitNotWritten, "another program has made this file meanwhile");
+  BlameTheDisk(transferred.fOutcome, part);
+  transferred.fOutcome.fReason += PartText(part);
+  return transferred;
+}
+
+// Gives the part, all of which has arrived, the name of the file.
+TTransferred Completed(TTransferred transferred, std::string const& file, bool overwrites) {
+  std::string const& part = transferred.fFile;
+  // An empty file does not arrive at all.
+  if (!fs::exists(part) && !MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
+  transferred.fBytes = fs::file_size(part);
+  transferred.fSha256 = Sha256Of(part);
+  if (!Rename(part, file, overwrites))
+    return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + ReasonOf(errno));
+  transferred.fFile = file;
+  return transferred;
+}
+
 }  // namespace
 
 void AddTransferOptions(CLI::App& command, TTransferOptions& options) {
@@ -261,26 +292,10 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
   transferred.fUrl = ShownUrlOf(remote);
   TLockFile const lock(part + ".lock");
   if (!lock.WhyNotHad().empty()) return Failed(transferred, kExitNotWritten, lock.WhyNotHad());
-  // A part that an earlier transfer left goes: the library would ask what is to become of it.
-  if (::unlink(part.c_str()) != 0 && errno != ENOENT) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
-  if (!MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
-  ::unlink(part.c_str());
+  if (!MakeRoomFor(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
   transferred.fOutcome = Transfer([&] { return Fetch(UrlOf(remote), part); }, transferred, remote.fPassword, false, options);
-  if (transferred.fOutcome.fStatus == kZEPStatusAlreadyExists)
-    return Failed(transferred, kExitNotWritten, "another program has made this file meanwhile");
-  if (transferred.fOutcome.fExit != kExitComplete) {
-    BlameTheDisk(transferred.fOutcome, part);
-    transferred.fOutcome.fReason += PartText(part);
-    return transferred;
-  }
-  // An empty file does not arrive at all.
-  if (!fs::exists(part) && !MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
-  transferred.fBytes = fs::file_size(part);
-  transferred.fSha256 = Sha256Of(part);
-  if (!Rename(part, file, overwrites))
-    return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + ReasonOf(errno));
-  transferred.fFile = file;
-  return transferred;
+  if (transferred.fOutcome.fExit != kExitComplete) return BrokenOff(transferred);
+  return Completed(transferred, file, overwrites);
 }
 
 int TellOf(TTransferred const& transferred, std::string const& command, bool asJson, TTransferOptions const& options) {
