@@ -2,20 +2,16 @@
 
 #include "TCIMDateTime.h"
 #include "TZEPException.h"
+#include "fuzz/Require.h"
 
 #include <cstddef>
 #include <cstdint>
-#include <cstdlib>
 #include <string>
 
 namespace {
 
 using NQRVZEP20::TCIMDateTime;
 using NQRVZEP20::TZEPException;
-
-void Require(bool isTrue) {
-  if (!isTrue) std::abort();
-}
 
 // Sets the datetime, and says whether the text was taken.
 bool SetOrRefuse(TCIMDateTime& dateTime, std::string const& text) {

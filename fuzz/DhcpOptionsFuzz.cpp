@@ -2,6 +2,7 @@
 // found must be the value of an option that the area holds whole.
 
 #include "AutoProxyDiscovery.h"
+#include "fuzz/Require.h"
 
 #include <sys/mman.h>
 #include <unistd.h>
@@ -13,10 +14,6 @@
 namespace {
 
 constexpr std::size_t kSize = AutoProxyDiscovery::kOptionsSize;
-
-void Require(bool condition) {
-  if (!condition) __builtin_trap();
-}
 
 unsigned char* AreaBeforeAnUnreadablePage() {
   auto const page = static_cast<std::size_t>(::sysconf(_SC_PAGESIZE));

@@ -1,17 +1,12 @@
 // Reads any bytes as an SMBIOS structure of every type that the host provider knows: each record has its shape, and each
 // property a value or a reason.
 
+#include "fuzz/Require.h"
 #include "providers/host/SmbiosRecords.h"
-
-#include <cstdlib>
 
 namespace NQRVZEP20 {
 
 namespace {
-
-void Require(bool isTrue) {
-  if (!isTrue) std::abort();
-}
 
 void RequireWhole(TRecord const& record, std::size_t properties) {
   Require(record.GetProperties().size() == properties);

@@ -1,17 +1,13 @@
 // Reads any bytes as hwinfo's output, as a SCSI address and as the kernel's list of USB devices.
 
+#include "fuzz/Require.h"
 #include "os/MediaTexts.h"
 
 #include <cstdint>
-#include <cstdlib>
 
 namespace NQRVZEP20 {
 
 namespace {
-
-void Require(bool isTrue) {
-  if (!isTrue) std::abort();
-}
 
 void ReadAll(std::string_view text) {
   for (std::string const& file : DeviceFilesIn(text, "Hardware Class: disk", "Virtual")) {

@@ -2,6 +2,7 @@
 // memory, and through what the core makes of the structures. Every structure must be whole and lie in the table.
 
 #include "TOSSpecific.h"
+#include "fuzz/Require.h"
 #include "os/MachineIdentity.h"
 #include "platform/include/smbios.h"
 #include "platform/smbios/SmbiosTable.h"
@@ -18,10 +19,6 @@
 namespace {
 
 using namespace NQRVZEP20;
-
-void Require(bool condition) {
-  if (!condition) __builtin_trap();
-}
 
 using TCounts = std::array<int, 256>;  // structures by type
 

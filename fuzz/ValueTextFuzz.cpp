@@ -4,9 +4,9 @@
 #include "TCIMReference.h"
 #include "TCIMValue.h"
 #include "TZEPException.h"
+#include "fuzz/Require.h"
 
 #include <cstdint>
-#include <cstdlib>
 #include <cstring>
 #include <ios>
 #include <locale>
@@ -18,10 +18,6 @@ namespace {
 using NQRVZEP20::TCIMValue;
 using NQRVZEP20::TZEPException;
 using TType = TCIMValue::TCIMType;
-
-void Require(bool condition) {
-  if (!condition) std::abort();
-}
 
 template <class TNumber>
 TNumber Extracted(std::string const& text) {

@@ -13,7 +13,7 @@ namespace NQRVZEP20 {
 template <class X>
 class TAddToVectorCallback {
 public:
-  explicit TAddToVectorCallback(std::vector<boost::shared_ptr<X>>& elements) : fElements(elements) {}
+  TAddToVectorCallback(std::vector<boost::shared_ptr<X>>& elements) : fElements(elements) {}
 
   bool operator()(boost::shared_ptr<X> element) {
     fElements.push_back(element);

@@ -12,7 +12,7 @@ namespace NQRVZEP20 {
 // ZEP_BOOST_ASSERT is "throwboost"; otherwise a failed assertion is a TZEPException (see AssertionHandler.h).
 class ZEP_EXPORT TBoostAssertException : public std::exception {
 public:
-  explicit TBoostAssertException(std::string message) : fMessage(std::move(message)) {}
+  TBoostAssertException(std::string message) : fMessage(std::move(message)) {}
   ~TBoostAssertException() override;
 
   // "Boost assertion failure! FILE:LINE [EXPRESSION] func = FUNCTION". Valid as long as the exception.

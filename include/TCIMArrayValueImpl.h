@@ -7,7 +7,7 @@ namespace NQRVZEP20 {
 // An array: its elements, each a TCIMValue of its own, which may be NULL. That they are of one type is TCIMValue's affair.
 class ZEP_EXPORT TCIMArrayValueImpl : public TCIMValueImpl {
 public:
-  explicit TCIMArrayValueImpl(std::vector<TCIMValue> const& elements);
+  TCIMArrayValueImpl(std::vector<TCIMValue> const& elements);
   TCIMArrayValueImpl(TCIMArrayValueImpl const& other);
   ~TCIMArrayValueImpl() override;
 

@@ -12,10 +12,10 @@ namespace NQRVZEP20 {
 class ZEP_EXPORT TCIMChar16Impl {
 public:
   TCIMChar16Impl() noexcept = default;  // code 0
-  explicit TCIMChar16Impl(unsigned short code) noexcept : fCode(code) {}
+  TCIMChar16Impl(unsigned short code) noexcept : fCode(code) {}
 
   // NULL, whatever the text says. Kept.
-  explicit TCIMChar16Impl(std::string const& text) noexcept;
+  TCIMChar16Impl(std::string const& text) noexcept;
 
   unsigned short GetValue() const noexcept { return fCode; }
 

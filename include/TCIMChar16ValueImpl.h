@@ -9,7 +9,7 @@ namespace NQRVZEP20 {
 // compared (kZEPStatusInvalidDateTime).
 class ZEP_EXPORT TCIMChar16ValueImpl : public TCIMValueImpl {
 public:
-  explicit TCIMChar16ValueImpl(TCIMChar16 const& character);
+  TCIMChar16ValueImpl(TCIMChar16 const& character);
   TCIMChar16ValueImpl(TCIMChar16ValueImpl const& other);
   ~TCIMChar16ValueImpl() override;
 

@@ -67,7 +67,7 @@ using ::copyInstMutex;
 
 class ZEP_EXPORT TCopyQualifierDecls {
 public:
-  explicit TCopyQualifierDecls(boost::weak_ptr<NQRVZEP20::ICIMNamespace> destination);
+  TCopyQualifierDecls(boost::weak_ptr<NQRVZEP20::ICIMNamespace> destination);
   bool operator()(boost::shared_ptr<NQRVZEP20::ICIMQualifierDecl> declaration);
 
 private:

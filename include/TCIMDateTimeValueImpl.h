@@ -8,7 +8,7 @@ namespace NQRVZEP20 {
 // The datetime kind of a TCIMValue's data.
 class ZEP_EXPORT TCIMDateTimeValueImpl : public TCIMValueImpl {
 public:
-  explicit TCIMDateTimeValueImpl(TCIMDateTime const& dateTime);
+  TCIMDateTimeValueImpl(TCIMDateTime const& dateTime);
   TCIMDateTimeValueImpl(TCIMDateTimeValueImpl const& other);
   ~TCIMDateTimeValueImpl() override;
 

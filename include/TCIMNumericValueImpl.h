@@ -8,17 +8,17 @@ namespace NQRVZEP20 {
 // kZEPStatusTypeMismatch.
 class ZEP_EXPORT TCIMNumericValueImpl : public TCIMValueImpl {
 public:
-  explicit TCIMNumericValueImpl(bool value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeBoolean), fBoolean(value) {}
-  explicit TCIMNumericValueImpl(unsigned char value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint8), fUint8(value) {}
-  explicit TCIMNumericValueImpl(signed char value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint8), fSint8(value) {}
-  explicit TCIMNumericValueImpl(unsigned short value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint16), fUint16(value) {}
-  explicit TCIMNumericValueImpl(short value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint16), fSint16(value) {}
-  explicit TCIMNumericValueImpl(unsigned int value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint32), fUint32(value) {}
-  explicit TCIMNumericValueImpl(int value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint32), fSint32(value) {}
-  explicit TCIMNumericValueImpl(unsigned long value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint64), fUint64(value) {}
-  explicit TCIMNumericValueImpl(long value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint64), fSint64(value) {}
-  explicit TCIMNumericValueImpl(float value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeReal32), fReal32(value) {}
-  explicit TCIMNumericValueImpl(double value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeReal64), fReal64(value) {}
+  TCIMNumericValueImpl(bool value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeBoolean), fBoolean(value) {}
+  TCIMNumericValueImpl(unsigned char value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint8), fUint8(value) {}
+  TCIMNumericValueImpl(signed char value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint8), fSint8(value) {}
+  TCIMNumericValueImpl(unsigned short value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint16), fUint16(value) {}
+  TCIMNumericValueImpl(short value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint16), fSint16(value) {}
+  TCIMNumericValueImpl(unsigned int value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint32), fUint32(value) {}
+  TCIMNumericValueImpl(int value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint32), fSint32(value) {}
+  TCIMNumericValueImpl(unsigned long value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint64), fUint64(value) {}
+  TCIMNumericValueImpl(long value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint64), fSint64(value) {}
+  TCIMNumericValueImpl(float value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeReal32), fReal32(value) {}
+  TCIMNumericValueImpl(double value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeReal64), fReal64(value) {}
   TCIMNumericValueImpl(TCIMNumericValueImpl const& other) noexcept = default;
   ~TCIMNumericValueImpl() override = default;
 

@@ -8,7 +8,7 @@ namespace NQRVZEP20 {
 // An object path.
 class ZEP_EXPORT TCIMReferenceValueImpl : public TCIMValueImpl {
 public:
-  explicit TCIMReferenceValueImpl(TCIMReference const& reference);
+  TCIMReferenceValueImpl(TCIMReference const& reference);
   TCIMReferenceValueImpl(TCIMReferenceValueImpl const& other);
   ~TCIMReferenceValueImpl() override;
 

@@ -7,8 +7,8 @@ namespace NQRVZEP20 {
 // A string: bytes, of which no encoding is assumed.
 class ZEP_EXPORT TCIMStringValueImpl : public TCIMValueImpl {
 public:
-  explicit TCIMStringValueImpl(std::string const& text);
-  explicit TCIMStringValueImpl(char const* text);
+  TCIMStringValueImpl(std::string const& text);
+  TCIMStringValueImpl(char const* text);
   TCIMStringValueImpl(TCIMStringValueImpl const& other);
   ~TCIMStringValueImpl() override;
 

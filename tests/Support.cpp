@@ -61,7 +61,8 @@ namespace {
 // The number of characters at the front of `text` that are digits or stand in `others`.
 std::size_t LengthOf(std::string_view text, std::string_view others) {
   std::size_t length = 0;
-  while (length < text.size() && (std::isdigit(static_cast<unsigned char>(text[length])) || others.find(text[length]) != others.npos))
+  while (length < text.size() &&
+         (std::isdigit(static_cast<unsigned char>(text[length])) || others.find(text[length]) != others.npos))
     ++length;
   return length;
 }

@@ -28,12 +28,12 @@ enum {
   kIpmiClientNoSession = 9,       /* nothing is open */
   kIpmiClientCompletionCode = 10, /* the controller answered that it did not carry the command out */
   kIpmiClientOutOfMemory = 11,
-  kIpmiClientFail = 12            /* anything else, such as answers that make no sense */
+  kIpmiClientFail = 12 /* anything else, such as answers that make no sense */
 };
 
 enum {
-  kIpmiClientLan = 3,             /* the mode of a connection over the LAN; there is no other */
-  kIpmiClientResponseSize = 256   /* the least size of a response buffer */
+  kIpmiClientLan = 3,           /* the mode of a connection over the LAN; there is no other */
+  kIpmiClientResponseSize = 256 /* the least size of a response buffer */
 };
 
 /*

@@ -7,8 +7,9 @@
  *
  * The tables are those the kernel exports (/sys/firmware/dmi/tables/DMI, which only root may read), or those in the file
  * that the environment variable ZEP_SMBIOS_TABLE names: a bare DMI table, or what `dmidecode --dump-bin` writes. The
- * variable is looked at by each smBiosLoad; the file read last is not read again while it is unchanged. A table ends at its end-of-table structure (type 127), or in front of the
- * first structure that is not whole; no more than the first 16 MiB of a file are looked at.
+ * variable is looked at by each smBiosLoad; the file read last is not read again while it is unchanged. A table ends at its
+ * end-of-table structure (type 127), or in front of the first structure that is not whole; no more than the first 16 MiB of a
+ * file are looked at.
  *
  * A handle holds a copy of the tables and is used by one thread at a time; any number may be open.
  */
@@ -20,7 +21,7 @@ extern "C" {
 /* What the functions return: statuses of the core's list, under the core's numbers. */
 enum {
   kSmbiosOk = 0,
-  kSmbiosFail = 3,          /* an argument that cannot be used; a file that cannot be read or holds no table */
+  kSmbiosFail = 3, /* an argument that cannot be used; a file that cannot be read or holds no table */
   kSmbiosOutOfMemory = 4,
   kSmbiosNoMoreItems = 5,   /* there is no structure of that type, or no further one */
   kSmbiosFileNotFound = 26, /* the kernel exports no tables, or the named file is not there */

@@ -124,9 +124,7 @@ void ExpectBlocksFrom(std::string const& document, std::string const& language, 
   EXPECT_EQ(found, count);
 }
 
-TEST(DocumentationTest, ReadmeShowsTheCodeOfTheExample) {
-  ExpectBlocksFrom("README.md", "cpp", "examples/ReadmeExample.cpp", 1);
-}
+TEST(DocumentationTest, ReadmeShowsTheCodeOfTheExample) { ExpectBlocksFrom("README.md", "cpp", "examples/ReadmeExample.cpp", 1); }
 
 TEST(DocumentationTest, WalkThroughShowsTheCodeOfTheExample) {
   ExpectBlocksFrom("docs/writing-a-provider.md", "cpp", "examples/Clock/Clock.cpp", 6);
@@ -136,6 +134,15 @@ TEST(DocumentationTest, WalkThroughShowsTheCodeOfTheExample) {
 
 TEST(DocumentationTest, PageOnSchemasShowsTheCodeOfTheExample) {
   ExpectBlocksFrom("docs/schemas.md", "cpp", "examples/Disks/Disks.cpp", 1);
+}
+
+TEST(DocumentationTest, TourShowsTheCodeOfTheExampleAndWhatItPrints) {
+  ExpectBlocksFrom("docs/tour.md", "cpp", "examples/Tour.cpp", 9);
+  std::string const command = "$ ZEP_SMBIOS_TABLE=tools/zep/sample/smbios.bin build/release/examples/Tour\n";
+  TTempDir const dir;  // for its log
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", ZEP_SOURCE_DIR "/tools/zep/sample/smbios.bin");
+  EXPECT_EQ(FirstBlockOf("docs/tour.md", "console"), command + OutputOf("cd " + dir.Path() + " && " ZEP_TOUR));
+  EXPECT_NE(ReadFile(dir.Path("tour.log")).find(" the fan turns slowly\n"), std::string::npos);
 }
 
 // Clocks run on: every number behind " = " is as good as another.

@@ -1,7 +1,8 @@
 // Calls one operation on plug-ins and prints what comes of it: the results, one a line; what was thrown; what was recorded in
 // the log, with its severity. With "load-plugins", one attempt for each path.
 //
-//   PluginProbe controller | root | nsps | nsps-elsewhere | nscs | services KIND | load-nsp NAME | load-nsc NAME | load-plugins PATH...
+//   PluginProbe controller | root | nsps | nsps-elsewhere | nscs | services KIND | load-nsp NAME | load-nsc NAME | load-plugins
+//   PATH...
 
 #include "IIPMILan.h"
 #include "INamespaceConsumer.h"

@@ -86,7 +86,7 @@ ${EXTRA_CONFIG:-}
 END
 "$proftpd" -n -q -c "$tmp/proftpd.conf" > "$tmp/out" 2>&1 &
 server=$!
-for _ in $(seq 100); do
+for _ in $(seq 400); do
   [ -n "$(ss -Hlnt "sport = :$port")" ] && break
   kill -0 "$server" 2>/dev/null || { cat "$tmp/out" >&2; fail "proftpd did not start"; }
   sleep 0.05

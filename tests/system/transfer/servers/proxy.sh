@@ -59,7 +59,7 @@ END
 
 python3 "$here/web.py" "$webport" "$page" "$weblog" & web=$!
 tinyproxy -d -c "$tmp/tinyproxy.conf" > "$tmp/out" 2>&1 & proxy=$!
-for _ in $(seq 100); do
+for _ in $(seq 400); do
   listening "$port" && listening "$webport" && break
   kill -0 "$proxy" 2>/dev/null || { cat "$tmp/out" "$log" >&2; fail "tinyproxy did not start"; }
   kill -0 "$web" 2>/dev/null || fail "the web server did not start"

@@ -94,7 +94,7 @@ unshare --mount bash -ec '
   mount --bind "$1/etc" /etc
   exec "$3" -D -e -f "$1/sshd_config"' setup "$tmp" "$root" "$sshd" >> "$log" 2>&1 &
 server=$!
-for _ in $(seq 100); do
+for _ in $(seq 400); do
   [ -n "$(ss -Hlnt "sport = :$port")" ] && break
   kill -0 "$server" 2>/dev/null || { cat "$log" >&2; fail "sshd did not start"; }
   sleep 0.05
