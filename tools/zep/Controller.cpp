@@ -37,8 +37,6 @@ std::string TakeField(std::string& said) {
   return field;
 }
 
-TJson OrNull(std::string const& field) { return field.empty() ? TJson(nullptr) : TJson(field); }
-
 std::string OrUnknown(std::string const& field) { return field.empty() ? "unknown" : field; }
 
 }  // namespace

@@ -17,4 +17,16 @@ enum EExitStatus {
   kExitStalled = 75        // nothing moved any more
 };
 
+// For programs: what it says of what was asked for. Every failure is "nothing".
+inline char const* NameOf(EExitStatus status) {
+  switch (status) {
+    case kExitComplete:
+      return "complete";
+    case kExitPartial:
+      return "partial";
+    default:
+      return "nothing";
+  }
+}
+
 }  // namespace NQRVZEP20::zep

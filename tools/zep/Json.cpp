@@ -26,10 +26,7 @@ TJson ArrayAsJson(std::vector<TCIMValue> const& elements) {
 // The word for the value, or those for the elements of an array; null where there is none.
 TJson WordsAsJson(TValueWords const& words, TCIMValue const& value) {
   if (words.Entries().empty() || value.IsNull()) return nullptr;
-  if (!value.IsArray()) {
-    std::string const word = words.WordFor(value);
-    return word.empty() ? TJson(nullptr) : TJson(word);
-  }
+  if (!value.IsArray()) return OrNull(words.WordFor(value));
   TJson array = TJson::array();
   for (TCIMValue const& element : static_cast<std::vector<TCIMValue>&>(value)) array.push_back(WordsAsJson(words, element));
   return array;
@@ -60,6 +57,8 @@ TJson DocumentHead(std::string const& what) {
 }
 
 std::string AsText(TJson const& document) { return document.dump(2, ' ', false, TJson::error_handler_t::replace) + "\n"; }
+
+TJson OrNull(std::string const& text) { return text.empty() ? TJson(nullptr) : TJson(text); }
 
 TJson ValueAsJson(TCIMValue const& value) {
   if (value.IsNull()) return nullptr;

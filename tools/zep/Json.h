@@ -20,6 +20,9 @@ TJson DocumentHead(std::string const& what);
 // A document as text. Bytes that are no UTF-8 become the replacement character.
 std::string AsText(TJson const& document);
 
+// The text; null for an empty one.
+TJson OrNull(std::string const& text);
+
 // Booleans and numbers become their JSON kinds (a real that is not finite a text), arrays arrays, NULL null, and all
 // others their text.
 TJson ValueAsJson(TCIMValue const& value);

@@ -1,5 +1,6 @@
 #include "Media.h"
 
+#include "Descriptor.h"
 #include "Failure.h"
 #include "Json.h"
 #include "TOSSpecific.h"
@@ -8,7 +9,6 @@
 #include <linux/cdrom.h>
 #include <sys/ioctl.h>
 #include <sys/sysmacros.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
@@ -88,10 +88,9 @@ void AddMediaOf(TJson const& drive, std::vector<TMedium>& media) {
 // Whether an optical drive is empty, which is asked for in a way that leaves its tray where it is.
 bool IsEmptyDrive(TMedium const& medium) {
   if (!medium.fIsOptical) return false;
-  int const fd = ::open(medium.fDevice.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
-  if (fd < 0) return errno == ENOMEDIUM;
-  int const status = ::ioctl(fd, CDROM_DRIVE_STATUS, CDSL_CURRENT);
-  ::close(fd);
+  TDescriptor const drive(::open(medium.fDevice.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+  if (!drive) return errno == ENOMEDIUM;
+  int const status = ::ioctl(drive.Get(), CDROM_DRIVE_STATUS, CDSL_CURRENT);
   return status == CDS_NO_DISC || status == CDS_TRAY_OPEN;
 }
 

@@ -10,7 +10,6 @@
 
 #include <CLI/CLI.hpp>
 
-#include <cstdio>
 #include <iostream>
 #include <memory>
 
@@ -23,16 +22,6 @@ struct TArguments {
   std::string fDevice;     // to mount
   std::string fDirectory;  // to unmount
 };
-
-// "4 MiB", "7.5 GiB": at most one digit behind the point, cut off there.
-std::string AsSize(std::uint64_t bytes) {
-  constexpr char const* units[] = {"KiB", "MiB", "GiB", "TiB"};
-  std::uint64_t tenths = bytes * 10 / 1024;
-  std::size_t unit = 0;
-  for (; unit + 1 < std::size(units) && tenths >= 10240; ++unit) tenths /= 1024;
-  std::string const digit = tenths % 10 == 0 ? "" : "." + std::to_string(tenths % 10);
-  return std::to_string(tenths / 10) + digit + " " + units[unit];
-}
 
 TJson SizeAsJson(std::uint64_t size) { return size == 0 ? TJson(nullptr) : TJson(size); }
 
@@ -48,12 +37,10 @@ std::string AsText(std::vector<TMedium> const& media) {
   TTable table({12, 9, 11, 11, 12, 15});
   table.Add({"Device", "Size", "Label", "File system", "Mounted at", "What it is"});
   for (TMedium const& medium : media)
-    table.Add({medium.fDevice, medium.fSize == 0 ? "-" : AsSize(medium.fSize), OrDash(medium.fLabel), OrDash(medium.fFileSystem),
-               MountedAt(medium), OrDash(medium.fDescription)});
+    table.Add({medium.fDevice, medium.fSize == 0 ? "-" : SizeText(medium.fSize), OrDash(medium.fLabel),
+               OrDash(medium.fFileSystem), MountedAt(medium), OrDash(medium.fDescription)});
   return table.GetText();
 }
-
-TJson OrNull(std::string const& text) { return text.empty() ? TJson(nullptr) : TJson(text); }
 
 std::string AsJson(std::vector<TMedium> const& media) {
   TJson document = DocumentHead("zep media");

@@ -10,25 +10,18 @@
 namespace NQRVZEP20::zep {
 
 void WriteOutput(std::string const& text) {
-  std::size_t written = 0;
-  while (written < text.size()) {
-    ssize_t const count = ::write(STDOUT_FILENO, text.data() + written, text.size() - written);
-    if (count < 0 && errno == EINTR) continue;
-    if (count < 0) throw std::system_error(errno, std::generic_category(), "standard output cannot be written");
-    written += static_cast<std::size_t>(count);
-  }
+  if (!WriteWhole(STDOUT_FILENO, text))
+    throw std::system_error(errno, std::generic_category(), "standard output cannot be written");
 }
 
 TOutputGuard::TOutputGuard() : fOutput(::dup(STDOUT_FILENO)) {
-  if (fOutput >= 0) ::dup2(STDERR_FILENO, STDOUT_FILENO);
+  if (fOutput) ::dup2(STDERR_FILENO, STDOUT_FILENO);
 }
 
 TOutputGuard::~TOutputGuard() {
   std::cout.flush();
   std::fflush(stdout);
-  if (fOutput < 0) return;
-  ::dup2(fOutput, STDOUT_FILENO);
-  ::close(fOutput);
+  if (fOutput) ::dup2(fOutput.Get(), STDOUT_FILENO);
 }
 
 }  // namespace NQRVZEP20::zep

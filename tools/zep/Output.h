@@ -1,5 +1,7 @@
 #pragma once
 
+#include "Descriptor.h"
+
 #include <string>
 
 namespace NQRVZEP20::zep {
@@ -18,7 +20,7 @@ public:
   TOutputGuard& operator=(TOutputGuard const&) = delete;
 
 private:
-  int fOutput;  // the real standard output; -1 when there is none
+  TDescriptor fOutput;  // the real standard output, when there is one
 };
 
 }  // namespace NQRVZEP20::zep

@@ -2,6 +2,9 @@
 
 #include "TOSSpecific.h"
 
+// The limits to plain HTTP are set as every libcurl knows them; newer ones have another way as well.
+#define CURL_DISABLE_DEPRECATION
+#include <curl/curl.h>
 #include <dlfcn.h>
 #include <strings.h>
 
@@ -16,22 +19,15 @@ namespace {
 
 constexpr std::size_t kMostBytes = 1 << 20;
 
-// Options of libcurl, whose numbers are fixed.
-constexpr int kTimeout = 13, kFailOnError = 45, kFollowLocation = 52, kMaxRedirects = 68, kConnectTimeout = 78, kNoSignal = 99,
-              kProtocols = 181, kRedirectProtocols = 182, kWriteData = 10001, kUrl = 10002, kErrorBuffer = 10010,
-              kNoProxy = 10177, kWriteFunction = 20011;
-constexpr long kHttp = 1;
-constexpr long kInitAll = 3;
-
-// The functions of libcurl that are used; libcurl.so is not linked.
+// The functions of libcurl that are used; libcurl.so is loaded, never linked.
 struct TCurl {
   std::unique_ptr<void, int (*)(void*)> fLibrary{nullptr, ::dlclose};
-  int (*fGlobalInit)(long) = nullptr;
-  void* (*fInit)() = nullptr;
-  int (*fSetOption)(void*, int, ...) = nullptr;
-  int (*fPerform)(void*) = nullptr;
-  void (*fCleanup)(void*) = nullptr;
-  void (*fGlobalCleanup)() = nullptr;
+  decltype(curl_global_init)* fGlobalInit = nullptr;
+  decltype(curl_easy_init)* fInit = nullptr;
+  decltype(curl_easy_setopt)* fSetOption = nullptr;
+  decltype(curl_easy_perform)* fPerform = nullptr;
+  decltype(curl_easy_cleanup)* fCleanup = nullptr;
+  decltype(curl_global_cleanup)* fGlobalCleanup = nullptr;
 };
 
 std::vector<std::string> LibraryNames() {
@@ -72,25 +68,25 @@ std::size_t Append(char const* bytes, std::size_t size, std::size_t count, void*
 
 // Empty, or why the file could not be had.
 std::string Transfer(TCurl const& curl, std::string const& url, std::string& text) {
-  std::unique_ptr<void, void (*)(void*)> const transfer(curl.fInit(), curl.fCleanup);
+  std::unique_ptr<CURL, decltype(curl_easy_cleanup)*> const transfer(curl.fInit(), curl.fCleanup);
   if (!transfer) return "libcurl does not start";
-  std::array<char, 256> error{};
-  void* const handle = transfer.get();
-  curl.fSetOption(handle, kErrorBuffer, error.data());
-  curl.fSetOption(handle, kUrl, url.c_str());
-  curl.fSetOption(handle, kProtocols, kHttp);
-  curl.fSetOption(handle, kRedirectProtocols, kHttp);
-  curl.fSetOption(handle, kFollowLocation, 1L);
-  curl.fSetOption(handle, kMaxRedirects, 5L);
-  curl.fSetOption(handle, kNoProxy, "*");
-  curl.fSetOption(handle, kFailOnError, 1L);
-  curl.fSetOption(handle, kConnectTimeout, 10L);
-  curl.fSetOption(handle, kTimeout, 30L);
-  curl.fSetOption(handle, kNoSignal, 1L);
-  curl.fSetOption(handle, kWriteFunction, &Append);
-  curl.fSetOption(handle, kWriteData, &text);
-  int const code = curl.fPerform(handle);
-  if (code == 0) return "";
+  std::array<char, CURL_ERROR_SIZE> error{};
+  CURL* const handle = transfer.get();
+  curl.fSetOption(handle, CURLOPT_ERRORBUFFER, error.data());
+  curl.fSetOption(handle, CURLOPT_URL, url.c_str());
+  curl.fSetOption(handle, CURLOPT_PROTOCOLS, long{CURLPROTO_HTTP});
+  curl.fSetOption(handle, CURLOPT_REDIR_PROTOCOLS, long{CURLPROTO_HTTP});
+  curl.fSetOption(handle, CURLOPT_FOLLOWLOCATION, 1L);
+  curl.fSetOption(handle, CURLOPT_MAXREDIRS, 5L);
+  curl.fSetOption(handle, CURLOPT_NOPROXY, "*");
+  curl.fSetOption(handle, CURLOPT_FAILONERROR, 1L);
+  curl.fSetOption(handle, CURLOPT_CONNECTTIMEOUT, 10L);
+  curl.fSetOption(handle, CURLOPT_TIMEOUT, 30L);
+  curl.fSetOption(handle, CURLOPT_NOSIGNAL, 1L);
+  curl.fSetOption(handle, CURLOPT_WRITEFUNCTION, &Append);
+  curl.fSetOption(handle, CURLOPT_WRITEDATA, &text);
+  CURLcode const code = curl.fPerform(handle);
+  if (code == CURLE_OK) return "";
   return error[0] != '\0' ? error.data() : "libcurl ends with code " + std::to_string(code);
 }
 
@@ -106,7 +102,7 @@ TPacFile FetchPacFile(std::string const& url) {
   }
   TCurl curl;
   if (!Load(curl, file.fFailure)) return file;
-  if (curl.fGlobalInit(kInitAll) != 0) {
+  if (curl.fGlobalInit(CURL_GLOBAL_ALL) != CURLE_OK) {
     file.fFailure = "libcurl does not start";
     return file;
   }

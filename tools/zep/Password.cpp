@@ -1,5 +1,6 @@
 #include "Password.h"
 
+#include "Descriptor.h"
 #include "Text.h"
 
 #include <fcntl.h>
@@ -40,51 +41,47 @@ public:
     ::sigemptyset(&fSignals);
     for (int const signal : {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGTSTP}) ::sigaddset(&fSignals, signal);
     ::sigprocmask(SIG_BLOCK, &fSignals, &fBefore);
-    fFile = ::signalfd(-1, &fSignals, SFD_CLOEXEC);
+    fFile = TDescriptor(::signalfd(-1, &fSignals, SFD_CLOEXEC));
   }
-  ~TSignalsLater() {
-    ::close(fFile);
-    ::sigprocmask(SIG_SETMASK, &fBefore, nullptr);
-  }
+  ~TSignalsLater() { ::sigprocmask(SIG_SETMASK, &fBefore, nullptr); }
   TSignalsLater(TSignalsLater const&) = delete;
   TSignalsLater& operator=(TSignalsLater const&) = delete;
 
-  int File() const { return fFile; }  // readable when one has come; below 0 when none can be had
+  int File() const { return fFile.Get(); }  // readable when one has come; below 0 when none can be had
 
 private:
   sigset_t fSignals, fBefore;
-  int fFile;
+  TDescriptor fFile;
 };
 
 // The terminal of the process, which shows nothing of what is typed as long as this lives.
 class TQuietTerminal {
 public:
   explicit TQuietTerminal(std::string const& otherwise) : fFile(::open("/dev/tty", O_RDWR | O_CLOEXEC)) {
-    if (fFile < 0 || ::tcgetattr(fFile, &fSettings) != 0)
+    if (!fFile || ::tcgetattr(fFile.Get(), &fSettings) != 0)
       throw std::runtime_error("there is no terminal to ask for the password: " + otherwise);
     termios settings = fSettings;
     settings.c_lflag &= ~static_cast<tcflag_t>(ECHO);
-    ::tcsetattr(fFile, TCSAFLUSH, &settings);
+    ::tcsetattr(fFile.Get(), TCSAFLUSH, &settings);
   }
   ~TQuietTerminal() {
     Write("\n");
-    ::tcsetattr(fFile, TCSAFLUSH, &fSettings);
-    ::close(fFile);
+    ::tcsetattr(fFile.Get(), TCSAFLUSH, &fSettings);
   }
   TQuietTerminal(TQuietTerminal const&) = delete;
   TQuietTerminal& operator=(TQuietTerminal const&) = delete;
 
-  void Write(std::string const& text) const { (void)!::write(fFile, text.data(), text.size()); }
+  void Write(std::string const& text) const { WriteWhole(fFile.Get(), text); }
 
   bool IsLineTypedBefore(TSignalsLater const& signals) const {
-    pollfd waiting[] = {{fFile, POLLIN, 0}, {signals.File(), POLLIN, 0}};
+    pollfd waiting[] = {{fFile.Get(), POLLIN, 0}, {signals.File(), POLLIN, 0}};
     ::poll(waiting, 2, -1);
     return waiting[1].revents == 0;
   }
 
   std::string ReadLine() const {
     std::string line;
-    for (char c = 0; ::read(fFile, &c, 1) == 1;) {
+    for (char c = 0; ::read(fFile.Get(), &c, 1) == 1;) {
       if (c == '\n') return line;
       line += c;
     }
@@ -92,7 +89,7 @@ public:
   }
 
 private:
-  int const fFile;
+  TDescriptor const fFile;
   termios fSettings;
 };
 

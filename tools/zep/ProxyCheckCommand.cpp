@@ -4,11 +4,9 @@
 #include "Failure.h"
 #include "Output.h"
 #include "TOSSpecific.h"
+#include "TScratchDirectory.h"
 #include "Text.h"
 #include "Transfer.h"
-
-#include <stdlib.h>
-#include <unistd.h>
 
 #include <CLI/CLI.hpp>
 
@@ -17,7 +15,6 @@
 #include <iostream>
 #include <memory>
 #include <sstream>
-#include <system_error>
 
 namespace NQRVZEP20::zep {
 
@@ -29,28 +26,6 @@ struct TArguments {
   TTransferOptions fOptions;
 };
 
-// A directory for the page, which the library writes into the working directory.
-class TScratch {
-public:
-  TScratch() {
-    std::string pattern = (std::filesystem::temp_directory_path() / "zep-proxy-check.XXXXXX").string();
-    if (::mkdtemp(pattern.data()) == nullptr) throw std::system_error(errno, std::generic_category(), "no temporary directory");
-    fPath = pattern;
-  }
-  ~TScratch() {
-    std::error_code ignored;
-    std::filesystem::remove_all(fPath, ignored);
-  }
-  TScratch(TScratch const&) = delete;
-  TScratch& operator=(TScratch const&) = delete;
-
-  std::string const& Path() const { return fPath; }
-  std::string PageFile() const { return fPath + "/content.html"; }
-
-private:
-  std::string fPath;
-};
-
 std::string FirstLineOf(std::string const& text) {
   constexpr std::size_t kLongest = 200;
   return Printable(text.substr(0, std::min(kLongest, text.find_first_of("\r\n"))));
@@ -58,8 +33,9 @@ std::string FirstLineOf(std::string const& text) {
 
 // Something may come back from the proxy itself: its refusal, or that it cannot reach the page. So the page has to be the one.
 TOutcome Check(TRemote const& proxy, TTransferOptions const& options) {
-  TScratch const scratch;
-  TWatch const watch{scratch.PageFile(), false, proxy.fPassword, options.fStallSeconds, {}};
+  TScratchDirectory const scratch("zep-proxy-check");  // the library writes the page into the working directory
+  std::string const pageFile = scratch.Path("content.html");
+  TWatch const watch{pageFile, false, proxy.fPassword, options.fStallSeconds, {}};
   TOutcome outcome = RunWatched(
       [&] {
         std::filesystem::current_path(scratch.Path());
@@ -68,7 +44,7 @@ TOutcome Check(TRemote const& proxy, TTransferOptions const& options) {
       watch);
   if (outcome.fExit != kExitComplete) return outcome;
   std::ostringstream page;
-  page << std::ifstream(scratch.PageFile()).rdbuf();
+  page << std::ifstream(pageFile).rdbuf();
   if (page.str().find(ZEP_PROXY_CHECK_TEXT) != std::string::npos) return outcome;
   std::string const answer = page.str().empty() ? "nothing came back" : "what came back begins with: " + FirstLineOf(page.str());
   return {kZEPStatusAccessDenied, kExitNothing, "the page did not come through; " + answer};

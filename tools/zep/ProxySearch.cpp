@@ -1,6 +1,7 @@
 #include "ProxySearch.h"
 
 #include "AutoProxyDiscovery.h"
+#include "Descriptor.h"
 #include "TOSSpecific.h"
 #include "TZEPException.h"
 
@@ -11,7 +12,6 @@
 #include <netpacket/packet.h>
 #include <poll.h>
 #include <sys/socket.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <array>
@@ -31,24 +31,9 @@ constexpr int kClientPort = 68;
 
 using TClock = std::chrono::steady_clock;
 
-// Closes a socket at the end of its scope.
-class TSocket {
-public:
-  explicit TSocket(int socket) : fSocket(socket) {}
-  ~TSocket() {
-    if (fSocket >= 0) ::close(fSocket);
-  }
-  TSocket(TSocket const&) = delete;
-  TSocket& operator=(TSocket const&) = delete;
-  int Get() const { return fSocket; }
-
-private:
-  int fSocket;
-};
-
 // 0, or the error of listening on the port right now.
 int ErrorOfListening() {
-  TSocket const socket(::socket(AF_INET, SOCK_DGRAM, 0));
+  TDescriptor const socket(::socket(AF_INET, SOCK_DGRAM, 0));
   sockaddr_in name{};
   name.sin_family = AF_INET;
   name.sin_port = htons(kClientPort);
@@ -176,9 +161,9 @@ void SendAndReceive(int sender, int receiver, TAsking& asking, TOnWait const& on
 
 // False when no other asking can do better.
 bool Ask(TAsking& asking, TOnWait const& onWait) {
-  TSocket const sender(AutoProxyDiscovery::open_send_socket());
-  TSocket const receiver(AutoProxyDiscovery::open_recv_socket(asking.fInterface.data()));
-  if (sender.Get() < 0 || receiver.Get() < 0)
+  TDescriptor const sender(AutoProxyDiscovery::open_send_socket());
+  TDescriptor const receiver(AutoProxyDiscovery::open_recv_socket(asking.fInterface.data()));
+  if (!sender || !receiver)
     asking.fFailure = "there is no socket";
   else if (!IsBound(receiver.Get()))
     asking.fFailure = "another program holds port 68";

@@ -7,6 +7,7 @@
 #include "Sample.h"
 #include "TCIMSchemaHelper.h"
 #include "TZEPException.h"
+#include "Text.h"
 
 #include <algorithm>
 #include <cstdio>
@@ -22,25 +23,57 @@ using TViews = std::vector<TNamespaceView>;
 
 // ---- Asking ----
 
+std::string const& kSystem = TCIMSchemaHelper::kSystemCreationClassName;
+std::string const& kOperatingSystem = TCIMSchemaHelper::kOperatingSystemCreationClassName;
+std::string const kProduct = "QRVSG_ZEPProduct";
+constexpr char const* kUnknownModel = "xxx";  // what the helper answers when the product name has no model
+
+struct TQuestion;
+TAnswer AnswerTo(TQuestion const& question, TNamespaceView const& view);
+
 // What one row of the identity asks, and the property that the answer comes from.
 struct TQuestion {
-  char const* key;
-  char const* label;
-  char const* className;
-  char const* property;
-  std::string (*ask)(TNamespacePtr ns);
+  char const* fKey;
+  char const* fLabel;
+  std::string const& fClassName;
+  char const* fProperty;
+  std::string (*fAsk)(TNamespacePtr ns);
+  TAnswer (*fAnswer)(TQuestion const& question, TNamespaceView const& view) = AnswerTo;
 };
 
-constexpr char const* kSystem = "QRVSG_ComputerSystem";
-constexpr char const* kOperatingSystem = "QRVSG_OperatingSystem";
-constexpr char const* kProduct = "QRVSG_ZEPProduct";
-constexpr char const* kUnknownModel = "xxx";  // what the helper answers when the product name has no model
+bool IsBlank(std::string const& text) { return text.find_first_not_of(" \t") == std::string::npos; }
+
+// What the helper answers; where it refuses, the reason is looked for in the property itself.
+TAnswer AnswerTo(TQuestion const& question, TNamespaceView const& view) {
+  auto const instances = view.InstancesOf(question.fClassName);
+  if (instances.empty()) return view.AnswerWithoutInstance(question.fClassName, question.fProperty);
+  if (instances.size() > 1)
+    return TAnswer::Unknown({kMissingUnexpected, "the provider describes " + std::to_string(instances.size()) + " of them"}, "");
+
+  TAnswer const raw = view.Answer(*instances.front(), question.fProperty);
+  if (!raw.fIsKnown) return raw;
+  try {
+    std::string const text = question.fAsk(view.Get());
+    if (IsBlank(text)) return TAnswer::Unknown({kMissingNotGiven, "the provider gives a blank text"}, raw.fSource);
+    return TAnswer::Known(text, raw.fSource);
+  } catch (TZEPException const& failure) {
+    EZEPStatusCode const status = failure.GetStatusCode().GetCode();
+    if (status != kZEPStatusInvalidFormat && status != kZEPStatusTypeMismatch) throw;
+    return TAnswer::Unknown({kMissingUnexpected, "not in the expected form: \"" + raw.fValue + "\""}, raw.fSource);
+  }
+}
+
+TAnswer AnswerWithModel(TQuestion const& question, TNamespaceView const& view) {
+  TAnswer const answer = AnswerTo(question, view);
+  if (!answer.fIsKnown || answer.fValue != kUnknownModel) return answer;
+  return TAnswer::Unknown({kMissingNotGiven, "the product name tells the machine type only"}, answer.fSource);
+}
 
 TQuestion const kIdentity[] = {
     {"hostName", "Host name", kSystem, "Name", TCIMSchemaHelper::GetSystemName},
     {"productName", "Product name", kSystem, "ProductName", TCIMSchemaHelper::GetSystemProductName},
     {"machineType", "Machine type", kSystem, "ProductName", TCIMSchemaHelper::GetMachineType},
-    {"model", "Model", kSystem, "ProductName", TCIMSchemaHelper::GetModelNumber},
+    {"model", "Model", kSystem, "ProductName", TCIMSchemaHelper::GetModelNumber, AnswerWithModel},
     {"serialNumber", "Serial number", kSystem, "SerialNumber",
      [](TNamespacePtr ns) { return TCIMSchemaHelper::GetSerialNumber(ns, TCIMContext()); }},
     {"osName", "OS", kOperatingSystem, "Name", TCIMSchemaHelper::GetOperatingSystemName},
@@ -51,34 +84,6 @@ TQuestion const kIdentity[] = {
     {"collectorBuild", "zepcore build", kProduct, "Build",
      [](TNamespacePtr ns) { return TCIMSchemaHelper::GetDataSourceBuild(ns, TCIMContext()); }},
 };
-
-bool IsBlank(std::string const& text) { return text.find_first_not_of(" \t") == std::string::npos; }
-
-// What the helper answers; where it refuses, the reason is looked for in the property itself.
-TAnswer Ask(TNamespaceView const& view, TQuestion const& question) {
-  auto const instances = view.InstancesOf(question.className);
-  if (instances.empty()) return view.AnswerWithoutInstance(question.className, question.property);
-  if (instances.size() > 1)
-    return TAnswer::Unknown({kMissingUnexpected, "the provider describes " + std::to_string(instances.size()) + " of them"}, "");
-
-  TAnswer const raw = view.Answer(*instances.front(), question.property);
-  if (!raw.fIsKnown) return raw;
-  try {
-    std::string const text = question.ask(view.Get());
-    if (IsBlank(text)) return TAnswer::Unknown({kMissingNotGiven, "the provider gives a blank text"}, raw.fSource);
-    return TAnswer::Known(text, raw.fSource);
-  } catch (TZEPException const& failure) {
-    EZEPStatusCode const status = failure.GetStatusCode().GetCode();
-    if (status != kZEPStatusInvalidFormat && status != kZEPStatusTypeMismatch) throw;
-    return TAnswer::Unknown({kMissingUnexpected, "not in the expected form: \"" + raw.fValue + "\""}, raw.fSource);
-  }
-}
-
-TAnswer AskForModel(TNamespaceView const& view, TQuestion const& question) {
-  TAnswer const answer = Ask(view, question);
-  if (!answer.fIsKnown || answer.fValue != kUnknownModel) return answer;
-  return TAnswer::Unknown({kMissingNotGiven, "the product name tells the machine type only"}, answer.fSource);
-}
 
 TMissing WhyNobodyAnswers(std::vector<TPlugIn> const& plugIns) {
   if (plugIns.empty()) return {kMissingNotDescribed, "no provider plug-in found"};
@@ -102,7 +107,7 @@ TAnswer AskEveryone(TViews const& views, std::vector<TPlugIn> const& plugIns, TA
 
 // ---- Details ----
 
-TAnswer PropertyOfFirst(TNamespaceView const& view, char const* className, char const* property) {
+TAnswer PropertyOfFirst(TNamespaceView const& view, std::string const& className, char const* property) {
   auto const instances = view.InstancesOf(className);
   if (instances.empty()) return view.AnswerWithoutInstance(className, property);
   return view.Answer(*instances.front(), property);
@@ -141,13 +146,6 @@ TAnswer Processors(TNamespaceView const& view) {
   return TAnswer::Known(text, source);
 }
 
-std::string AsSize(unsigned long bytes) {
-  constexpr char const* units[] = {"bytes", "KiB", "MiB", "GiB", "TiB"};
-  std::size_t unit = 0;
-  for (; unit + 1 < std::size(units) && bytes >= 1024 && bytes % 1024 == 0; ++unit) bytes /= 1024;
-  return std::to_string(bytes) + " " + units[unit];
-}
-
 // "128 GiB in 8 modules"
 TAnswer Memory(TNamespaceView const& view) {
   auto const modules = view.InstancesOf("CIM_PhysicalMemory");
@@ -162,15 +160,16 @@ TAnswer Memory(TNamespaceView const& view) {
       ++unknown;
   }
   if (unknown == modules.size()) return capacity;
-  std::string text = AsSize(bytes) + " in " + std::to_string(modules.size()) + (modules.size() == 1 ? " module" : " modules");
+  std::string text =
+      ExactSizeText(bytes) + " in " + std::to_string(modules.size()) + (modules.size() == 1 ? " module" : " modules");
   if (unknown > 0) text += ", " + std::to_string(unknown) + " of them of unknown size";
   return TAnswer::Known(text, capacity.fSource);
 }
 
 struct TDetail {
-  char const* key;
-  char const* label;
-  TAnswer (*ask)(TNamespaceView const& view);
+  char const* fKey;
+  char const* fLabel;
+  TAnswer (*fAnswer)(TNamespaceView const& view);
 };
 
 constexpr TDetail kDetails[] = {
@@ -248,12 +247,11 @@ TReport MakeReport(std::vector<TPlugIn> plugIns) {
   report.fPlugIns = std::move(plugIns);
   TViews const views = ViewsOf(report.fPlugIns);
   for (TQuestion const& question : kIdentity) {
-    auto const ask = question.key == std::string("model") ? AskForModel : Ask;
-    auto const askView = [&](TNamespaceView const& view) { return ask(view, question); };
-    report.fIdentity.push_back({question.key, question.label, AskEveryone(views, report.fPlugIns, askView)});
+    auto const answer = [&](TNamespaceView const& view) { return question.fAnswer(question, view); };
+    report.fIdentity.push_back({question.fKey, question.fLabel, AskEveryone(views, report.fPlugIns, answer)});
   }
   for (TDetail const& row : kDetails)
-    report.fDetails.push_back({row.key, row.label, AskEveryone(views, report.fPlugIns, row.ask)});
+    report.fDetails.push_back({row.fKey, row.fLabel, AskEveryone(views, report.fPlugIns, row.fAnswer)});
   report.fHead = HeadLines(report);
   report.fStatus = StatusOf(report);
   return report;

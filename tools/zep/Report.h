@@ -34,4 +34,8 @@ std::string ReportAsText(TReport const& report);  // ReportText.cpp
 // One JSON document, with every instance of every namespace besides (ReportJson.cpp).
 std::string ReportAsJson(TReport const& report);
 
+// What a file with the report is called: "zep-report-db1-20261121T041530Z" and the extension. The host name is the report's own,
+// "unknown" when it has none, in characters that every file system takes; the time is now, in UTC (ReportFileName.cpp).
+std::string ReportFileName(TReport const& report, char const* extension);
+
 }  // namespace NQRVZEP20::zep

@@ -7,13 +7,10 @@
 #include "Sample.h"
 #include "SendReport.h"
 #include "TMountedMedium.h"
-#include "TOSSpecific.h"
 #include "Text.h"
 
 #include <CLI/CLI.hpp>
 
-#include <algorithm>
-#include <cstdio>
 #include <iostream>
 #include <memory>
 
@@ -29,20 +26,6 @@ struct TArguments {
   TTransferOptions fOptions;
   std::string fMedium;  // the device to write to; empty for standard output
 };
-
-// "zep-report-db1-20261121-041530.txt", of characters that every file system takes.
-std::string FileNameOf(TReport const& report, bool asJson) {
-  auto const isHost = [](TReportRow const& row) { return row.fKey == "hostName"; };
-  auto const row = std::find_if(report.fIdentity.begin(), report.fIdentity.end(), isHost);
-  std::string host = row != report.fIdentity.end() && row->fAnswer.fIsKnown ? row->fAnswer.fValue : "unknown";
-  for (char& c : host)
-    if (std::isalnum(static_cast<unsigned char>(c)) == 0 && c != '-') c = '_';
-  TCIMDateTime const now = TOSSpecific::GetLocalTime();
-  char time[64];
-  std::snprintf(time, sizeof time, "-%04u%02u%02u-%02u%02u%02u", unsigned{now.GetYear()}, unsigned{now.GetMonth()},
-                unsigned{now.GetDay()}, unsigned{now.GetHour()}, unsigned{now.GetMinute()}, unsigned{now.GetSecond()});
-  return "zep-report-" + host.substr(0, 64) + time + (asJson ? ".json" : ".txt");
-}
 
 // Where it is still mounted. Also unmounts a medium that could not be written; the reason for that is the one that counts.
 std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::string const& name, std::string const& text) {
@@ -64,7 +47,7 @@ std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::stri
 }
 
 void WriteToMedium(TReport const& report, TArguments const& arguments) {
-  std::string const name = FileNameOf(report, arguments.fAsJson);
+  std::string const name = ReportFileName(report, arguments.fAsJson ? ".json" : ".txt");
   std::string const text = arguments.fAsJson ? ReportAsJson(report) : ReportAsText(report);
   TMountedMedium const medium(arguments.fMedium);
   std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);

@@ -1,23 +1,13 @@
+#include "Report.h"
+
 #include "Failure.h"
 #include "ICIMInstance.h"
 #include "Json.h"
-#include "Report.h"
 #include "Sample.h"
 
 namespace NQRVZEP20::zep {
 
 namespace {
-
-char const* NameOf(EExitStatus status) {
-  switch (status) {
-    case kExitComplete:
-      return "complete";
-    case kExitPartial:
-      return "partial";
-    default:
-      return "nothing";
-  }
-}
 
 TJson RowsAsJson(std::vector<TReportRow> const& rows) {
   TJson json = TJson::object();
@@ -31,8 +21,6 @@ TJson RowsAsJson(std::vector<TReportRow> const& rows) {
   return json;
 }
 
-TJson TextOrNull(std::string const& text) { return text.empty() ? TJson(nullptr) : TJson(text); }
-
 TJson PlugInsAsJson(std::vector<TPlugIn> const& plugIns) {
   TJson json = TJson::array();
   for (TPlugIn const& plugIn : plugIns) {
@@ -41,11 +29,11 @@ TJson PlugInsAsJson(std::vector<TPlugIn> const& plugIns) {
       providers.push_back({{"name", provider.fName},
                            {"namespace", provider.fView ? TJson(provider.fView->GetName()) : TJson(nullptr)},
                            {"milliseconds", provider.fMilliseconds},
-                           {"error", TextOrNull(provider.fError)}});
+                           {"error", OrNull(provider.fError)}});
     json.push_back({{"name", plugIn.fName},
                     {"file", plugIn.fFile},
                     {"milliseconds", plugIn.fMilliseconds},
-                    {"error", TextOrNull(plugIn.fError)},
+                    {"error", OrNull(plugIn.fError)},
                     {"providers", providers}});
   }
   return json;
@@ -71,7 +59,7 @@ std::string ReportAsJson(TReport const& report) {
   document["status"] = NameOf(report.fStatus);
   document["exitStatus"] = static_cast<int>(report.fStatus);
   document["head"] = report.fHead;
-  document["smbiosTableFile"] = TextOrNull(TableFile());
+  document["smbiosTableFile"] = OrNull(TableFile());
   document["identity"] = RowsAsJson(report.fIdentity);
   document["details"] = RowsAsJson(report.fDetails);
   document["plugInDirectory"] = PlugInDirectory();

@@ -1,15 +1,11 @@
 #include "SendReport.h"
 
 #include "TOSSpecific.h"
+#include "TScratchDirectory.h"
 #include "TZEPException.h"
 #include "Text.h"
 
-#include <stdlib.h>
-#include <unistd.h>
-
 #include <cerrno>
-#include <ctime>
-#include <filesystem>
 #include <fstream>
 #include <iostream>
 #include <system_error>
@@ -17,28 +13,6 @@
 namespace NQRVZEP20::zep {
 
 namespace {
-
-namespace fs = std::filesystem;
-
-std::string HostName() {
-  char name[256] = "";
-  ::gethostname(name, sizeof name - 1);
-  return name[0] == '\0' ? "unknown" : name;
-}
-
-std::string FileName() {
-  std::time_t const now = std::time(nullptr);
-  std::tm fields{};
-  char time[32];
-  std::strftime(time, sizeof time, "%Y%m%dT%H%M%SZ", ::gmtime_r(&now, &fields));
-  return "zep-report-" + HostName() + "-" + time + ".json";
-}
-
-std::string MakeDirectory() {
-  std::string pattern = (fs::temp_directory_path() / "zep-report.XXXXXX").string();
-  if (::mkdtemp(pattern.data()) == nullptr) throw std::system_error(errno, std::generic_category(), "no temporary directory");
-  return pattern;
-}
 
 void WriteReport(TReport const& report, std::string const& file) {
   std::ofstream stream(file);
@@ -59,17 +33,21 @@ std::string Packed(std::string const& file) {
   return file;
 }
 
-void SayWhereItIsKept(std::string const& file) { std::cerr << "zep: the report is kept in " << Printable(file) << "\n"; }
+void KeepAndSayWhere(std::string const& file, TScratchDirectory& directory) {
+  directory.Keep();
+  std::cerr << "zep: the report is kept in " << Printable(file) << "\n";
+}
 
-TTransferred SendOrSayWhereItIsKept(std::string const& file, TTarget const& target, TTransferOptions const& options) {
+TTransferred SendOrKeep(std::string const& file, TScratchDirectory& directory, TTarget const& target,
+                        TTransferOptions const& options) {
   try {
     TTransferred const sent = SendFile(file, target, "", options);
     if (sent.fOutcome.fExit == kExitComplete) return sent;
     std::cerr << "zep: " << sent.fUrl << ": " << sent.fOutcome.fReason << "\n";
-    SayWhereItIsKept(file);
+    KeepAndSayWhere(file, directory);
     return sent;
   } catch (...) {
-    SayWhereItIsKept(file);
+    KeepAndSayWhere(file, directory);
     throw;
   }
 }
@@ -77,14 +55,13 @@ TTransferred SendOrSayWhereItIsKept(std::string const& file, TTarget const& targ
 }  // namespace
 
 EExitStatus SendReport(TReport const& report, TTarget const& target, TTransferOptions const& options) {
-  std::string const directory = MakeDirectory(), file = directory + "/" + FileName();
+  TScratchDirectory directory("zep-report");
+  std::string const file = directory.Path(ReportFileName(report, ".json"));
   WriteReport(report, file);
-  TTransferred const sent = SendOrSayWhereItIsKept(Packed(file), target, options);
+  TTransferred const sent = SendOrKeep(Packed(file), directory, target, options);
   if (sent.fOutcome.fExit != kExitComplete) return sent.fOutcome.fExit;
   if (!options.fQuiet)
     std::cerr << "zep: sent to " << sent.fUrl << ": " << sent.fBytes << " bytes, SHA-256 " << sent.fSha256 << "\n";
-  std::error_code ignored;
-  fs::remove_all(directory, ignored);
   return report.fStatus;
 }
 

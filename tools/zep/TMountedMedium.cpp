@@ -1,5 +1,6 @@
 #include "TMountedMedium.h"
 
+#include "Descriptor.h"
 #include "Drives.h"
 #include "Failure.h"
 #include "TOSSpecific.h"
@@ -18,20 +19,9 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-class TFile {
-public:
-  TFile(int directory, std::string const& name, int flags) : fFd(::openat(directory, name.c_str(), flags | O_CLOEXEC, 0644)) {}
-  ~TFile() {
-    if (fFd >= 0) ::close(fFd);
-  }
-  TFile(TFile const&) = delete;
-  TFile& operator=(TFile const&) = delete;
-
-  int Get() const { return fFd; }
-
-private:
-  int fFd;
-};
+TDescriptor Open(int directory, std::string const& name, int flags) {
+  return TDescriptor(::openat(directory, name.c_str(), flags | O_CLOEXEC, 0644));
+}
 
 [[noreturn]] void Throw(std::string const& what) { throw std::runtime_error(what); }
 
@@ -104,15 +94,6 @@ void CheckDirectory(std::string const& directory) {
 
 // ---- Writing ----
 
-void WriteAll(int fd, std::string const& contents, std::string const& what) {
-  for (std::size_t done = 0; done < contents.size();) {
-    ssize_t const count = ::write(fd, contents.data() + done, contents.size() - done);
-    if (count < 0 && errno == EINTR) continue;
-    ThrowIf(count < 0, what);
-    done += static_cast<std::size_t>(count);
-  }
-}
-
 // To a name that nothing has yet. Some file systems in user space cannot see to that by themselves.
 void RenameToNew(int directory, std::string const& from, std::string const& to, std::string const& what) {
   if (::renameat2(directory, from.c_str(), directory, to.c_str(), RENAME_NOREPLACE) == 0) return;
@@ -138,16 +119,16 @@ TMountedMedium::TMountedMedium(std::string const& device) {
 void TMountedMedium::Write(std::string const& name, std::string const& contents) const {
   std::string const what = name + " cannot be written on " + Device();
   if (fMount.fIsReadOnly) Throw(what + ": the medium is read-only");
-  TFile const directory(AT_FDCWD, fMountPoint, O_RDONLY | O_DIRECTORY);
-  ThrowIf(directory.Get() < 0, what);
+  TDescriptor const directory = Open(AT_FDCWD, fMountPoint, O_RDONLY | O_DIRECTORY);
+  ThrowIf(!directory, what);
 
   // Under another name at first, so that a medium that is pulled out never bears half a file under this one.
   std::string const draft = name + ".part";
   std::string present = draft;
-  TFile const file(directory.Get(), draft, O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW);
-  ThrowIf(file.Get() < 0, what);
+  TDescriptor const file = Open(directory.Get(), draft, O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW);
+  ThrowIf(!file, what);
   try {
-    WriteAll(file.Get(), contents, what);
+    ThrowIf(!WriteWhole(file.Get(), contents), what);
     ThrowIf(::fsync(file.Get()) != 0, what);
     RenameToNew(directory.Get(), draft, name, what);
     present = name;
@@ -166,13 +147,13 @@ std::vector<std::string> UnmountDirectory(std::string const& directory) {
 
   TDrives const drives = DrivesOf(*mount);
   // Opened before: it then tells of what could not be written while unmounting.
-  TFile const source(AT_FDCWD, mount->fSource, O_RDONLY | O_NONBLOCK);
+  TDescriptor const source = Open(AT_FDCWD, mount->fSource, O_RDONLY | O_NONBLOCK);
   try {
     TOSSpecific::UnmountDevice(mount->fSource, directory);
   } catch (TZEPException const&) {
     Throw(directory + " cannot be unmounted: something still uses it");
   }
-  if (source.Get() >= 0) ThrowIf(::fsync(source.Get()) != 0, mount->fSource + " is unmounted, but was not written to its end");
+  if (source) ThrowIf(::fsync(source.Get()) != 0, mount->fSource + " is unmounted, but was not written to its end");
   return MountPointsOf(drives);
 }
 

@@ -1,8 +1,9 @@
 #include "Text.h"
 
 #include <algorithm>
-#include <cstdint>
+#include <cmath>
 #include <cstdio>
+#include <iterator>
 
 namespace NQRVZEP20::zep {
 
@@ -88,6 +89,23 @@ std::vector<std::string> Wrapped(std::string_view text, std::size_t width) {
   }
   if (!text.empty() || lines.empty()) lines.push_back(WithoutTrailingBlanks(text));
   return lines;
+}
+
+std::string SizeText(std::uint64_t bytes) {
+  constexpr char const* units[] = {"B", "KiB", "MiB", "GiB", "TiB"};
+  double size = static_cast<double>(bytes);
+  std::size_t unit = 0;
+  for (; unit + 1 < std::size(units) && size >= 1023.95; ++unit) size /= 1024;  // what would be rounded to 1024
+  long const tenths = std::lround(size * 10);
+  std::string const digit = tenths % 10 == 0 ? "" : "." + std::to_string(tenths % 10);
+  return std::to_string(tenths / 10) + digit + " " + units[unit];
+}
+
+std::string ExactSizeText(std::uint64_t bytes) {
+  constexpr char const* units[] = {"bytes", "KiB", "MiB", "GiB", "TiB"};
+  std::size_t unit = 0;
+  for (; unit + 1 < std::size(units) && bytes >= 1024 && bytes % 1024 == 0; ++unit) bytes /= 1024;
+  return std::to_string(bytes) + " " + units[unit];
 }
 
 void TTable::Add(std::vector<std::string> const& cells) {

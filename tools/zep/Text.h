@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstdint>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -15,6 +16,12 @@ std::size_t WidthOf(std::string_view text);
 
 // Lines of at most `width` characters, broken at blanks where that is possible; at least one line.
 std::vector<std::string> Wrapped(std::string_view text, std::size_t width);
+
+// A size for people, rounded to a tenth: "390.6 KiB", "4 MiB".
+std::string SizeText(std::uint64_t bytes);
+
+// A size to the byte, in the largest unit that it is a whole number of: "512 MiB", "1025 bytes".
+std::string ExactSizeText(std::uint64_t bytes);
 
 // A table with a title line and columns of fixed widths, two blanks apart. A cell that is too long goes on in the next
 // line. Cells are made printable here.

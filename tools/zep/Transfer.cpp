@@ -1,5 +1,6 @@
 #include "Transfer.h"
 
+#include "Descriptor.h"
 #include "Failure.h"
 #include "Output.h"
 #include "Sha256.h"
@@ -29,16 +30,6 @@ namespace fs = std::filesystem;
 std::string ReasonOf(int error) { return std::generic_category().message(error); }
 
 // ---- Progress ----
-
-std::string SizeText(std::uint64_t bytes) {
-  char const* const units[] = {"B", "KiB", "MiB", "GiB", "TiB"};
-  double size = static_cast<double>(bytes);
-  std::size_t unit = 0;
-  for (; size >= 1024 && unit < 4; ++unit) size /= 1024;
-  char text[32];
-  std::snprintf(text, sizeof text, unit == 0 ? "%.0f %s" : "%.1f %s", size, units[unit]);
-  return text;
-}
 
 // One line on the terminal of standard error, written over and over, and gone at the end.
 class TProgress {
@@ -135,9 +126,7 @@ public:
     while (Open() && !IsStillThere()) Close();  // the one that had it has just removed it
   }
   ~TLockFile() {
-    if (fFile < 0) return;
-    ::unlink(fPath.c_str());
-    Close();
+    if (fFile) ::unlink(fPath.c_str());
   }
   TLockFile(TLockFile const&) = delete;
   TLockFile& operator=(TLockFile const&) = delete;
@@ -146,23 +135,20 @@ public:
 
 private:
   bool Open() {
-    fFile = ::open(fPath.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0666);
-    if (fFile >= 0 && ::flock(fFile, LOCK_EX | LOCK_NB) == 0) return true;
+    fFile = TDescriptor(::open(fPath.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0666));
+    if (fFile && ::flock(fFile.Get(), LOCK_EX | LOCK_NB) == 0) return true;
     fWhyNotHad = errno == EWOULDBLOCK ? "another transfer into the file goes on" : ReasonOf(errno);
     Close();
     return false;
   }
-  void Close() {
-    if (fFile >= 0) ::close(fFile);
-    fFile = -1;
-  }
+  void Close() { fFile = TDescriptor(); }
   bool IsStillThere() const {
     struct stat held, named;
-    return ::fstat(fFile, &held) == 0 && ::stat(fPath.c_str(), &named) == 0 && IsSameFile(held, named);
+    return ::fstat(fFile.Get(), &held) == 0 && ::stat(fPath.c_str(), &named) == 0 && IsSameFile(held, named);
   }
 
   std::string fPath, fWhyNotHad;
-  int fFile = -1;
+  TDescriptor fFile;
 };
 
 // The library asks about a file that is in the way, which can only be one that somebody else has made just now: it meets the
@@ -182,23 +168,20 @@ bool Rename(std::string const& from, std::string const& to, bool overwrites) {
 }
 
 bool MakeEmptyFile(std::string const& path) {
-  int const file = ::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL, 0666);
-  return file >= 0 && ::close(file) == 0;
+  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL, 0666));
+  return static_cast<bool>(file);
 }
 
 // Whether more could be written to the file. False, with errno set, on a full disk.
 bool CanGrow(std::string const& path) {
-  int const file = ::open(path.c_str(), O_WRONLY | O_APPEND);
-  if (file < 0) return errno == ENOENT;
-  off_t const size = ::lseek(file, 0, SEEK_END);
-  char const block[4096] = "";
-  errno = ENOSPC;  // for a write that is cut short
-  bool const isWritten = ::write(file, block, sizeof block) == static_cast<ssize_t>(sizeof block);
+  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_APPEND));
+  if (!file) return errno == ENOENT;
+  off_t const size = ::lseek(file.Get(), 0, SEEK_END);
+  bool const isWritten = WriteWhole(file.Get(), std::string(4096, '\0'));
   int const error = errno;
-  bool const isAsBefore = ::ftruncate(file, size) == 0;
-  ::close(file);
+  if (::ftruncate(file.Get(), size) != 0) return false;
   errno = error;
-  return isWritten && isAsBefore;
+  return isWritten;
 }
 
 // Makes a failed transfer one of the local disk, when that is the cause.
@@ -213,6 +196,37 @@ std::string PartText(std::string const& part) {
   std::error_code absent;
   std::uintmax_t const size = fs::file_size(part, absent);
   return absent ? "; nothing arrived" : "; the " + SizeText(size) + " that arrived are in " + Printable(part);
+}
+
+// A part that an earlier transfer left goes: the library would ask what is to become of it. False, with errno set, when no new
+// one could be made.
+bool MakeRoomFor(std::string const& part) {
+  if (::unlink(part.c_str()) != 0 && errno != ENOENT) return false;
+  if (!MakeEmptyFile(part)) return false;
+  ::unlink(part.c_str());
+  return true;
+}
+
+TTransferred BrokenOff(TTransferred transferred) {
+  std::string const& part = transferred.fFile;
+  if (transferred.fOutcome.fStatus == kZEPStatusAlreadyExists)
+    return Failed(transferred, kExitNotWritten, "another program has made this file meanwhile");
+  BlameTheDisk(transferred.fOutcome, part);
+  transferred.fOutcome.fReason += PartText(part);
+  return transferred;
+}
+
+// Gives the part, all of which has arrived, the name of the file.
+TTransferred Completed(TTransferred transferred, std::string const& file, bool overwrites) {
+  std::string const& part = transferred.fFile;
+  // An empty file does not arrive at all.
+  if (!fs::exists(part) && !MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
+  transferred.fBytes = fs::file_size(part);
+  transferred.fSha256 = Sha256Of(part);
+  if (!Rename(part, file, overwrites))
+    return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + ReasonOf(errno));
+  transferred.fFile = file;
+  return transferred;
 }
 
 }  // namespace
@@ -278,26 +292,10 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
   transferred.fUrl = ShownUrlOf(remote);
   TLockFile const lock(part + ".lock");
   if (!lock.WhyNotHad().empty()) return Failed(transferred, kExitNotWritten, lock.WhyNotHad());
-  // A part that an earlier transfer left goes: the library would ask what is to become of it.
-  if (::unlink(part.c_str()) != 0 && errno != ENOENT) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
-  if (!MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
-  ::unlink(part.c_str());
+  if (!MakeRoomFor(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
   transferred.fOutcome = Transfer([&] { return Fetch(UrlOf(remote), part); }, transferred, remote.fPassword, false, options);
-  if (transferred.fOutcome.fStatus == kZEPStatusAlreadyExists)
-    return Failed(transferred, kExitNotWritten, "another program has made this file meanwhile");
-  if (transferred.fOutcome.fExit != kExitComplete) {
-    BlameTheDisk(transferred.fOutcome, part);
-    transferred.fOutcome.fReason += PartText(part);
-    return transferred;
-  }
-  // An empty file does not arrive at all.
-  if (!fs::exists(part) && !MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
-  transferred.fBytes = fs::file_size(part);
-  transferred.fSha256 = Sha256Of(part);
-  if (!Rename(part, file, overwrites))
-    return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + ReasonOf(errno));
-  transferred.fFile = file;
-  return transferred;
+  if (transferred.fOutcome.fExit != kExitComplete) return BrokenOff(transferred);
+  return Completed(transferred, file, overwrites);
 }
 
 int TellOf(TTransferred const& transferred, std::string const& command, bool asJson, TTransferOptions const& options) {

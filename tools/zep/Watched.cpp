@@ -1,6 +1,7 @@
 #include "Watched.h"
 
 #include "ILogger.h"
+#include "TChildProcess.h"
 #include "TRootObject.h"
 #include "TZEPException.h"
 #include "Text.h"
@@ -8,9 +9,7 @@
 #include <fcntl.h>
 #include <poll.h>
 #include <signal.h>
-#include <sys/prctl.h>
 #include <sys/stat.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -61,15 +60,12 @@ std::string ReportOf(std::function<TZEPStatusCode()> const& transfer) {
   return std::to_string(status.GetCode()) + " " + reason;
 }
 
-[[noreturn]] void RunInChild(std::function<TZEPStatusCode()> const& transfer, int reportEnd) {
-  ::prctl(PR_SET_PDEATHSIG, SIGKILL);  // a transfer does not outlive zep
-  int const nowhere = ::open("/dev/null", O_RDWR);
-  ::dup2(nowhere, STDIN_FILENO);
-  ::dup2(nowhere, STDOUT_FILENO);
+std::string ReportOfSilent(std::function<TZEPStatusCode()> const& transfer) {
+  TDescriptor const nowhere(::open("/dev/null", O_RDWR));
+  ::dup2(nowhere.Get(), STDIN_FILENO);
+  ::dup2(nowhere.Get(), STDOUT_FILENO);
   if (ILogger* const logger = TRootObject::GetCoreLogger()) logger->ClearLog();
-  std::string const report = ReportOf(transfer);
-  bool const isTold = ::write(reportEnd, report.data(), report.size()) == static_cast<ssize_t>(report.size());
-  ::_exit(isTold ? 0 : 1);
+  return ReportOf(transfer);
 }
 
 // ---- In zep ----
@@ -127,20 +123,17 @@ TOutcome Stalled(TWatch const& watch) {
 }
 
 // Reads the report until the child is done; false when it stood still for too long.
-bool ReadReport(int end, pid_t process, TWatch const& watch, std::string& report) {
+bool ReadReport(TChildProcess& child, TWatch const& watch, std::string& report) {
   struct stat const file = StatusOf(watch.fFile);
-  std::uint64_t last = BytesMoved(watch, file, process);
+  std::uint64_t last = BytesMoved(watch, file, child.Id());
   TClock::time_point lastMoved = TClock::now();
-  pollfd waiting{end, POLLIN, 0};
-  char chunk[4096];
+  pollfd waiting{child.Output(), POLLIN, 0};
   while (true) {
     if (::poll(&waiting, 1, kLookEveryMilliseconds) > 0) {
-      ssize_t const got = ::read(end, chunk, sizeof chunk);
-      if (got <= 0) return true;
-      report.append(chunk, static_cast<std::size_t>(got));
+      if (!child.Read(report)) return true;
       continue;
     }
-    std::uint64_t const now = BytesMoved(watch, file, process);
+    std::uint64_t const now = BytesMoved(watch, file, child.Id());
     if (watch.fShowProgress) watch.fShowProgress(now);
     if (now != last) lastMoved = TClock::now();
     last = now;
@@ -151,19 +144,11 @@ bool ReadReport(int end, pid_t process, TWatch const& watch, std::string& report
 }  // namespace
 
 TOutcome RunWatched(std::function<TZEPStatusCode()> const& transfer, TWatch const& watch) {
-  int ends[2];
-  if (::pipe2(ends, O_CLOEXEC) != 0) throw std::system_error(errno, std::generic_category(), "no pipe");
-  pid_t const child = ::fork();
-  if (child < 0) throw std::system_error(errno, std::generic_category(), "no process");
-  if (child == 0) RunInChild(transfer, ends[1]);
-
-  ::close(ends[1]);
+  TChildProcess child([&] { return ReportOfSilent(transfer); }, SIGKILL);  // a transfer does not outlive zep
   std::string report;
-  bool const isDone = ReadReport(ends[0], child, watch, report);
-  ::close(ends[0]);
-  if (!isDone) ::kill(child, SIGKILL);
-  ::waitpid(child, nullptr, 0);
-  return isDone ? OutcomeOf(report, watch) : Stalled(watch);
+  if (!ReadReport(child, watch, report)) return Stalled(watch);
+  child.End();
+  return OutcomeOf(report, watch);
 }
 
 }  // namespace NQRVZEP20::zep

@@ -36,7 +36,7 @@ struct TFindings {
   std::optional<TPacFile> fPacFile;  // when it was asked for and there is a URL
 
   bool IsComplete() const { return !fSearch.fUrl.empty() && (!fPacFile || fPacFile->fFailure.empty()); }
-  int ExitStatus() const { return fSearch.fUrl.empty() ? kExitNothing : IsComplete() ? kExitComplete : kExitPartial; }
+  EExitStatus ExitStatus() const { return fSearch.fUrl.empty() ? kExitNothing : IsComplete() ? kExitComplete : kExitPartial; }
 };
 
 // ---- Before the start ----
@@ -132,8 +132,6 @@ std::string AsText(TFindings const& findings) {
   return text;
 }
 
-TJson OrNull(std::string const& text) { return text.empty() ? TJson(nullptr) : TJson(text); }
-
 TJson AskingAsJson(TAsking const& asking) {
   TJson json = {{"interface", OrNull(asking.fInterface)}};
   json["up"] = asking.fInterface.empty() ? TJson(nullptr) : TJson(asking.fIsUp);
@@ -153,9 +151,8 @@ TJson AskingAsJson(TAsking const& asking) {
 
 std::string AsJson(TFindings const& findings) {
   TJson document = DocumentHead("zep wpad");
-  char const* const statusNames[] = {"complete", "nothing", "partial"};
-  document["status"] = statusNames[findings.ExitStatus()];
-  document["exitStatus"] = findings.ExitStatus();
+  document["status"] = NameOf(findings.ExitStatus());
+  document["exitStatus"] = static_cast<int>(findings.ExitStatus());
   document["url"] = OrNull(findings.fSearch.fUrl);
   document["stoppedClients"] = findings.fStoppedClients;
   document["messageBytes"] = AutoProxyDiscovery::kMessageSize;
@@ -179,32 +176,42 @@ std::string WhatIsMissing(TFindings const& findings) {
   return findings.fSearch.fFailure.empty() ? "nobody named a proxy configuration file" : findings.fSearch.fFailure;
 }
 
-int Wpad(TArguments const& arguments) {
-  std::string const whyNot = WhyNoListening();
-  if (!whyNot.empty()) {
-    std::cerr << "zep: " << whyNot << "\n";
-    return kExitNothing;
-  }
-  TFindings findings;
-  if (!arguments.fKeepsClients) {
-    TellWhatWillHappen();
-    if (!arguments.fIsConfirmed && !IsConfirmed()) {
-      std::cerr << "zep: nothing was done; --yes confirms, and --no-stop leaves the DHCP clients alone\n";
-      return kExitNothing;
-    }
-    AutoProxyDiscovery::wpadPreconfig();
-    findings.fStoppedClients = true;
-  }
-  if (IsPortTaken()) std::cerr << "zep: another program holds port 68; trying again for up to 30 s\n";
-  {
-    TCountdown countdown;
-    findings.fSearch = SearchProxy([&](TAsking const& asking, int secondsLeft) { countdown.Show(asking, secondsLeft); });
-  }
-  if (arguments.fFetches && !findings.fSearch.fUrl.empty()) findings.fPacFile = FetchPacFile(findings.fSearch.fUrl);
+// ---- The steps ----
 
-  WriteOutput(arguments.fAsJson ? AsJson(findings) : AsText(findings));
+int NothingBecause(std::string const& reason) {
+  std::cerr << "zep: " << reason << "\n";
+  return kExitNothing;
+}
+
+// False, with the clients left alone, when the user does not want it.
+bool StopClients(bool isConfirmed) {
+  TellWhatWillHappen();
+  if (!isConfirmed && !IsConfirmed()) return false;
+  AutoProxyDiscovery::wpadPreconfig();
+  return true;
+}
+
+TSearch Search() {
+  if (IsPortTaken()) std::cerr << "zep: another program holds port 68; trying again for up to 30 s\n";
+  TCountdown countdown;
+  return SearchProxy([&](TAsking const& asking, int secondsLeft) { countdown.Show(asking, secondsLeft); });
+}
+
+void Tell(TFindings const& findings, bool asJson) {
+  WriteOutput(asJson ? AsJson(findings) : AsText(findings));
   std::string const missing = WhatIsMissing(findings);
   if (!missing.empty()) std::cerr << "zep: " << missing << "\n";
+}
+
+int Wpad(TArguments const& arguments) {
+  std::string const whyNot = WhyNoListening();
+  if (!whyNot.empty()) return NothingBecause(whyNot);
+  if (!arguments.fKeepsClients && !StopClients(arguments.fIsConfirmed))
+    return NothingBecause("nothing was done; --yes confirms, and --no-stop leaves the DHCP clients alone");
+  TFindings findings{Search(), !arguments.fKeepsClients, {}};
+  std::string const& url = findings.fSearch.fUrl;
+  if (arguments.fFetches && !url.empty()) findings.fPacFile = FetchPacFile(url);
+  Tell(findings, arguments.fAsJson);
   return findings.ExitStatus();
 }
 

@@ -314,7 +314,7 @@ TEST_F(ZepMediaTest, AReportIsOnTheMediumWhenZepEnds) {
               std::sort(names.begin(), names.end());
               EXPECT_EQ(names.size(), 2u) << Joined(names);
               if (names.size() != 2) return "no report";
-              EXPECT_THAT(names[1], testing::MatchesRegex("zep-report-sample-server-20[0-9]{6}-[0-9]{6}\\.txt"));
+              EXPECT_THAT(names[1], testing::MatchesRegex("zep-report-sample-server-20[0-9]{6}T[0-9]{6}Z\\.txt"));
               EXPECT_EQ(run.output, "The report is " + names[1] + " on " + loop.Path() + ", which can be taken out.\n");
               EXPECT_THAT(ReadFile("/proc/self/mounts"), Not(HasSubstr("/mnt/key")));
 
@@ -426,7 +426,7 @@ TEST_F(ZepMediaTest, AReportOnABusyMediumIsThereThoughItCannotBeUnmounted) {
     return Replaced(report, loop.Path(), "LOOP") + Joined(NamesIn(dir_.Path("key")));
   });
   EXPECT_THAT(text,
-              testing::MatchesRegex("zep: (zep-report-sample-server-[0-9-]*\\.txt) is written on LOOP, but /mnt/key cannot be "
+              testing::MatchesRegex("zep: (zep-report-sample-server-[0-9TZ]*\\.txt) is written on LOOP, but /mnt/key cannot be "
                                     "unmounted: something still uses it\nexit status 1\nlabel.txt zep-report-.*\\.txt"));
 }
 

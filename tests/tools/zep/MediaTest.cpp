@@ -238,9 +238,9 @@ TEST_F(MediaCommandTest, ATableTellsSizesAndWhereMediaAreMounted) {
   struct TRow {
     std::string size, shown;
   };
-  TRow const rows[] = {{"512", "0.5 KiB"},          {"1024", "1 KiB"},         {"1536", "1.5 KiB"},
-                       {"7864320", "7.5 MiB"},      {"8053063680", "7.5 GiB"}, {"8589934592", "8 GiB"},
-                       {"15728640000", "14.6 GiB"}, {"2199023255552", "2 TiB"}};
+  TRow const rows[] = {
+      {"512", "512 B"},          {"1024", "1 KiB"},       {"1536", "1.5 KiB"},         {"7864320", "7.5 MiB"},
+      {"8053063680", "7.5 GiB"}, {"8589934592", "8 GiB"}, {"15728640000", "14.6 GiB"}, {"2199023255552", "2 TiB"}};
   std::string list;
   for (TRow const& row : rows)
     list += std::string(list.empty() ? "" : ",") + R"({"name":"/dev/sdb","type":"disk","rm":true,"model":"Key","size":)" +

@@ -90,5 +90,30 @@ TEST(TextTest, CellsAreMadePrintable) {
   EXPECT_EQ(table.GetText(), "\\x1b[2J\\x0a\n");
 }
 
+TEST(TextTest, SizesAreRoundedOrExact) {
+  struct TRow {
+    std::uint64_t bytes;
+    char const *rounded, *exact;
+  } const rows[] = {
+      {0, "0 B", "0 bytes"},
+      {1023, "1023 B", "1023 bytes"},
+      {1024, "1 KiB", "1 KiB"},
+      {1025, "1 KiB", "1025 bytes"},
+      {1536, "1.5 KiB", "1536 bytes"},
+      {400000, "390.6 KiB", "400000 bytes"},
+      {1048524, "1023.9 KiB", "1048524 bytes"},
+      {1048525, "1 MiB", "1048525 bytes"},
+      {1048575, "1 MiB", "1048575 bytes"},
+      {7864320, "7.5 MiB", "7680 KiB"},
+      {8535000000, "7.9 GiB", "8535000000 bytes"},
+      {2199023255552, "2 TiB", "2 TiB"},
+      {1152921504606846976, "1048576 TiB", "1048576 TiB"},
+  };
+  for (TRow const& row : rows) {
+    EXPECT_EQ(SizeText(row.bytes), row.rounded) << row.bytes;
+    EXPECT_EQ(ExactSizeText(row.bytes), row.exact) << row.bytes;
+  }
+}
+
 }  // namespace
 }  // namespace NQRVZEP20::zep

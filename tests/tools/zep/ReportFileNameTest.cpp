@@ -1,0 +1,51 @@
+#include "tools/zep/Report.h"
+
+#include "tests/Support.h"
+
+#include <gmock/gmock.h>
+
+#include <ctime>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+TReport ReportOn(TAnswer const& hostName) {
+  TReport report{};
+  report.fIdentity = {{"productName", "Product name", TAnswer::Known("Server", "")}, {"hostName", "Host name", hostName}};
+  return report;
+}
+
+TEST(ReportFileNameTest, BearsTheHostNameOfTheReport) {
+  struct TRow {
+    TAnswer hostName;
+    std::string inName;
+  };
+  TRow const rows[] = {
+      {TAnswer::Known("db1", ""), "db1"},
+      {TAnswer::Known("DB-1.example.com", ""), "DB-1_example_com"},
+      {TAnswer::Known("../a b\xc3\xa4\n", ""), "___a_b___"},
+      {TAnswer::Known(std::string(100, 'x'), ""), std::string(64, 'x')},
+      {TAnswer::Unknown({}, ""), "unknown"},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.inName);
+    EXPECT_THAT(ReportFileName(ReportOn(row.hostName), ".txt"),
+                testing::MatchesRegex("zep-report-" + row.inName + "-[0-9]{8}T[0-9]{6}Z\\.txt"));
+  }
+  EXPECT_THAT(ReportFileName({}, ".json"), testing::MatchesRegex("zep-report-unknown-[0-9]{8}T[0-9]{6}Z\\.json"));
+}
+
+TEST(ReportFileNameTest, BearsTheTimeInUtc) {
+  TEnvironmentGuard const zone("TZ", "EAST-5");
+  ::tzset();
+  std::time_t const before = std::time(nullptr);
+  std::string const name = ReportFileName(ReportOn(TAnswer::Known("db1", "")), ".json");
+  std::tm fields{};
+  ASSERT_NE(::strptime(name.c_str(), "zep-report-db1-%Y%m%dT%H%M%SZ.json", &fields), nullptr) << name;
+  std::time_t const told = ::timegm(&fields);
+  EXPECT_GE(told, before);
+  EXPECT_LE(told, std::time(nullptr));
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep
