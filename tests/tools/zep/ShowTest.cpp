@@ -105,7 +105,7 @@ TEST_F(ShowTest, AReferenceIsShownAsItsPath) {
 TEST_F(ShowTest, WhatIsNotThereIsAnError) {
   for (std::string const path :
        {"CIM_Nothing", "root/zep/host:CIM_Nothing", "root/other:CIM_Chassis", "CIM_Chassis.Tag=\"Chassis 7\"",
-        "CIM_Chassis.Nothing=\"1\"", "CIM_Chassis.Tag=", "", ":", "root/zep/host:", "\"", "CIM_Chassis.Tag=\"a"}) {
+        "CIM_Chassis.Nothing=\"1\"", "CIM_Chassis.Tag=", ":", "root/zep/host:", "\"", "CIM_Chassis.Tag=\"a"}) {
     TRun const run = Run({"show", path});
     EXPECT_EQ(run.status, 1) << path;
     EXPECT_EQ(run.output, "") << path;
