@@ -3,6 +3,7 @@
 #include "ClassTree.h"
 #include "Commands.h"
 #include "ExitStatus.h"
+#include "Failure.h"
 #include "Json.h"
 #include "MofFile.h"
 #include "Output.h"
@@ -89,39 +90,34 @@ std::string AsJson(std::vector<TNamespaceClasses> const& namespaces) {
   return zep::AsText(document);
 }
 
-// Tells of the plug-ins that failed; true when there is one.
-bool ReportFailures(std::vector<TPlugIn> const& plugIns) {
-  bool isAny = false;
-  for (TPlugIn const& plugIn : plugIns) {
-    if (!plugIn.HasFailed()) continue;
-    isAny = true;
-    if (!plugIn.fError.empty()) std::cerr << "zep: " << Printable(plugIn.fName + ": " + plugIn.fError) << "\n";
-    for (TProviderRun const& provider : plugIn.fProviders)
-      if (!provider.fError.empty()) std::cerr << "zep: " << Printable(provider.fName + ": " + provider.fError) << "\n";
+struct TClasses {
+  std::vector<TNamespaceClasses> fNamespaces;
+  std::string fFailures;  // a line for each provider that failed
+};
+
+TClasses FindClasses(TArguments const& arguments) {
+  TClasses classes;
+  bool const isMof = !arguments.fMofFile.empty();
+  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugIns();
+  classes.fFailures = FailuresAsText(plugIns);
+  for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
+    std::string const failure = FailureOf([&] {
+      classes.fNamespaces.push_back({view.GetProviderName(), view.GetName(), ClassesOf(*view.Get())});
+    });
+    if (!failure.empty()) classes.fFailures += Printable("zep: " + view.GetProviderName() + ": " + failure) + "\n";
   }
-  return isAny;
+  return classes;
 }
 
 int Classes(TArguments const& arguments) {
   if (arguments.fSample) SelectSample();
-  std::vector<TNamespaceView> views;
-  bool hasFailed = false;
-  if (arguments.fMofFile.empty()) {
-    std::vector<TPlugIn> const plugIns = LoadPlugIns();
-    hasFailed = ReportFailures(plugIns);
-    views = ViewsOf(plugIns);
-  } else
-    views.push_back(ViewOfMof(arguments.fMofFile));
-
-  std::vector<TNamespaceClasses> namespaces;
+  TClasses const classes = OrFailureDocument("zep classes", arguments.fAsJson, [&] { return FindClasses(arguments); });
   bool isAny = false;
-  for (TNamespaceView const& view : views) {
-    namespaces.push_back({view.GetProviderName(), view.GetName(), ClassesOf(*view.Get())});
-    isAny = isAny || !namespaces.back().fClasses.empty();
-  }
-  WriteOutput(arguments.fAsJson ? AsJson(namespaces) : AsText(namespaces, arguments.fAsTree));
+  for (TNamespaceClasses const& ns : classes.fNamespaces) isAny = isAny || !ns.fClasses.empty();
+  std::cerr << classes.fFailures;
+  WriteOutput(arguments.fAsJson ? AsJson(classes.fNamespaces) : AsText(classes.fNamespaces, arguments.fAsTree));
   if (!isAny) std::cerr << "zep: there is no class\n";
-  return !isAny ? kExitNothing : hasFailed ? kExitPartial : kExitComplete;
+  return !isAny ? kExitNothing : !classes.fFailures.empty() ? kExitPartial : kExitComplete;
 }
 
 }  // namespace

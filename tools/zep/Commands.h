@@ -18,6 +18,9 @@ struct TCommand {
   TRun (*fAddArguments)(CLI::App& command);
 };
 
+// Stands in front of the words that "zep run" runs, which are the rest of the remaining ones, whatever they look like.
+constexpr char const* kCommandFollows = "command:";
+
 TRun AddClassesArguments(CLI::App& command);     // ClassesCommand.cpp
 TRun AddConfigArguments(CLI::App& command);      // ConfigCommand.cpp
 TRun AddGetArguments(CLI::App& command);         // GetCommand.cpp

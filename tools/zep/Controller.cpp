@@ -1,5 +1,6 @@
 #include "Controller.h"
 
+#include "ControllerSession.h"
 #include "IIPMILan.h"
 #include "TOSSpecific.h"
 #include "Text.h"
@@ -23,11 +24,10 @@ std::string Field(std::string const& text) {
 
 bool IsTold(std::string const& field) { return !field.empty() && field != "N/A"; }
 
-std::string WithoutASession(TClock::time_point start) {
+std::string WithoutASession(TClock::time_point start, std::string const& why) {
   char seconds[32];
   std::snprintf(seconds, sizeof seconds, "%.1f s", std::chrono::duration<double>(TClock::now() - start).count());
-  return "no session with its controller after " + std::string(seconds) +
-         ": it gave no answer or refused the account, or libipmiClient.so is missing";
+  return std::string(3, kEnd) + "no session with its controller after " + seconds + ": " + why + kEnd;
 }
 
 std::string TakeField(std::string& said) {
@@ -43,8 +43,10 @@ std::string OrUnknown(std::string const& field) { return field.empty() ? "unknow
 
 std::string AskController(std::string const& host, TAccount const& account) {
   auto const start = TClock::now();
+  std::string const why = WhyNoSession(host, account);
+  if (!why.empty()) return WithoutASession(start, why);
   std::string const answer = TOSSpecific::GetRemoteMT(host, account.fUser, account.fPassword);
-  if (answer.empty()) return std::string(3, kEnd) + WithoutASession(start) + kEnd;
+  if (answer.empty()) return WithoutASession(start, "it gave one, but not a second time");
   std::string const type = Field(answer);
   std::string const model = Field(TOSSpecific::GetRemoteMachineModel(host, account.fUser, account.fPassword));
   std::string const serialNumber = Field(TOSSpecific::GetRemoteMSN(host, account.fUser, account.fPassword));

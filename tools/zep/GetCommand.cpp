@@ -78,7 +78,6 @@ TRun AddGetArguments(CLI::App& command) {
   command.add_flag("--no-clobber", arguments->fNoClobber, "Leave a file that is there as it is, without asking")->excludes(force);
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddTransferOptions(command, arguments->fOptions);
-  command.allow_extras();  // HasExtras refuses them
   command.footer(
       "A file that is there is overwritten after a question, which is asked on a terminal only; of a symbolic link the file "
       "that\n"
@@ -86,7 +85,7 @@ TRun AddGetArguments(CLI::App& command) {
       "that\n"
       "name.\n" +
       TransferHelp());
-  return [&command, arguments] { return HasExtras(command) ? kExitUsage : Get(*arguments); };
+  return [arguments] { return Get(*arguments); };
 }
 
 }  // namespace NQRVZEP20::zep

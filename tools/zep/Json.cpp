@@ -1,5 +1,6 @@
 #include "Json.h"
 
+#include "ExitStatus.h"
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
 #include "ICIMProperty.h"
@@ -59,6 +60,13 @@ TJson DocumentHead(std::string const& what) {
 std::string AsText(TJson const& document) { return document.dump(2, ' ', false, TJson::error_handler_t::replace) + "\n"; }
 
 TJson OrNull(std::string const& text) { return text.empty() ? TJson(nullptr) : TJson(text); }
+
+std::string FailureAsJson(std::string const& what, std::string const& reason) {
+  TJson document = DocumentHead(what);
+  document["exitStatus"] = static_cast<int>(kExitNothing);
+  document["reason"] = reason;
+  return AsText(document);
+}
 
 TJson ValueAsJson(TCIMValue const& value) {
   if (value.IsNull()) return nullptr;

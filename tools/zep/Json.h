@@ -1,10 +1,12 @@
 #pragma once
 
+#include "Output.h"
 #include "TCIMValue.h"
 #include "TNamespaceView.h"
 
 #include <nlohmann/json.hpp>
 
+#include <exception>
 #include <string>
 
 namespace NQRVZEP20::zep {
@@ -22,6 +24,20 @@ std::string AsText(TJson const& document);
 
 // The text; null for an empty one.
 TJson OrNull(std::string const& text);
+
+// The document of a command that told nothing, as text: the head, "exitStatus" (kExitNothing) and "reason".
+std::string FailureAsJson(std::string const& what, std::string const& reason);
+
+// Runs the work. When that throws, and JSON is wanted, the failure's document is printed and the exception goes on.
+template <class TWork>
+auto OrFailureDocument(std::string const& what, bool asJson, TWork work) {
+  try {
+    return work();
+  } catch (std::exception const& failure) {
+    if (asJson) WriteOutput(FailureAsJson(what, failure.what()));
+    throw;
+  }
+}
 
 // Booleans and numbers become their JSON kinds (a real that is not finite a text), arrays arrays, NULL null, and all
 // others their text.

@@ -90,14 +90,15 @@ std::string AsJson(std::string const& file, TCensus const& census) {
   return zep::AsText(document);
 }
 
-int Mof(TArguments const& arguments) {
+std::string MofAsText(TArguments const& arguments) {
   TNamespaceView const view = ViewOfMof(arguments.fFile);
-  if (arguments.fPrint)
-    WriteOutput(WriteMof(*view.Get()));
-  else {
-    TCensus const census(*view.Get());
-    WriteOutput(arguments.fAsJson ? AsJson(arguments.fFile, census) : AsText(arguments.fFile, census));
-  }
+  if (arguments.fPrint) return WriteMof(*view.Get());
+  TCensus const census(*view.Get());
+  return arguments.fAsJson ? AsJson(arguments.fFile, census) : AsText(arguments.fFile, census);
+}
+
+int Mof(TArguments const& arguments) {
+  WriteOutput(OrFailureDocument("zep mof", arguments.fAsJson, [&] { return MofAsText(arguments); }));
   return kExitComplete;
 }
 

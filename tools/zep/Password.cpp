@@ -10,7 +10,9 @@
 #include <termios.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <cstdlib>
+#include <cstring>
 #include <fstream>
 #include <optional>
 #include <stdexcept>
@@ -22,9 +24,13 @@ namespace {
 constexpr char const* kVariable = "ZEP_BMC_PASSWORD";
 
 std::string PasswordIn(std::string const& path) {
+  errno = 0;
   std::ifstream file(path);
   std::string line;
-  if (!std::getline(file, line)) throw std::runtime_error("there is no password in " + Printable(path));
+  bool const isThere = static_cast<bool>(std::getline(file, line));
+  if (!isThere && errno != 0) throw std::runtime_error(path + " cannot be read: " + std::strerror(errno));
+  if (!isThere) throw std::runtime_error("there is no password in " + path);
+  if (!line.empty() && line.back() == '\r') line.pop_back();
   return line;
 }
 

@@ -6,6 +6,7 @@
 #include "Output.h"
 #include "TOSSpecific.h"
 #include "TRootObject.h"
+#include "Text.h"
 
 #include <algorithm>
 #include <chrono>
@@ -48,6 +49,16 @@ std::string LinkerReason(std::string const& plugIn, std::string const& otherwise
   return otherwise;
 }
 
+// The last error that the log has behind the entries that it had before, in brackets; an exception alone does not tell where.
+std::string ErrorLoggedSince(std::size_t entriesBefore) {
+  auto const& entries = TRootObject::GetCoreLogger()->GetLog();
+  std::string error;
+  std::size_t at = 0;
+  for (ILogger::TLogEntry const& entry : entries)
+    if (at++ >= entriesBefore && entry.fSeverity == ILogger::kLogError) error = " (" + entry.fMessage + ")";
+  return error;
+}
+
 TProviderRun Ask(std::string const& name, boost::shared_ptr<INamespaceProvider> provider) {
   TProviderRun run{name, {}, 0, ""};
   auto const fill = [&] {
@@ -55,7 +66,9 @@ TProviderRun Ask(std::string const& name, boost::shared_ptr<INamespaceProvider> 
     if (!ns) throw std::runtime_error("it has no namespace");
     run.fView = std::make_shared<TNamespaceView>(name, ns);
   };
+  std::size_t const entries = TRootObject::GetCoreLogger()->GetLog().size();
   run.fError = TimedFailureOf(fill, run.fMilliseconds);
+  if (!run.fError.empty()) run.fError += ErrorLoggedSince(entries);
   return run;
 }
 
@@ -92,6 +105,18 @@ std::vector<TNamespaceView> ViewsOf(std::vector<TPlugIn> const& plugIns) {
     for (TProviderRun const& provider : plugIn.fProviders)
       if (provider.fView) views.push_back(*provider.fView);
   return views;
+}
+
+std::string FailuresAsText(std::vector<TPlugIn> const& plugIns) {
+  std::string text;
+  auto const add = [&text](std::string const& name, std::string const& error) {
+    if (!error.empty()) text += Printable("zep: " + name + ": " + error) + "\n";
+  };
+  for (TPlugIn const& plugIn : plugIns) {
+    add(plugIn.fName, plugIn.fError);
+    for (TProviderRun const& provider : plugIn.fProviders) add(provider.fName, provider.fError);
+  }
+  return text;
 }
 
 std::string PlugInDirectory() { return std::filesystem::path(TOSSpecific::GetZEPRootPath()).lexically_normal().string(); }

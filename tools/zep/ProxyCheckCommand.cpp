@@ -82,13 +82,12 @@ TRun AddProxyCheckArguments(CLI::App& command) {
   command.add_option("proxy", arguments->fProxy, "[USER@]HOST:PORT")->required();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddTransferOptions(command, arguments->fOptions);
-  command.allow_extras();  // HasExtras refuses them
   command.footer(
       "A web page is fetched through the proxy; the check is passed when it is that page which comes back.\n"
       "The password comes from netrc or from a prompt.\n"
       "Exit status: 0 when the page came back, 1 when something else did, 64 for wrong usage, 68 when the proxy is unknown or\n"
       "does not answer, 69 without libcurl, 75 when nothing moved for too long.");
-  return [&command, arguments] { return HasExtras(command) ? kExitUsage : ProxyCheck(*arguments); };
+  return [arguments] { return ProxyCheck(*arguments); };
 }
 
 }  // namespace NQRVZEP20::zep

@@ -3,6 +3,7 @@
 #include "Commands.h"
 #include "Controller.h"
 #include "ExitStatus.h"
+#include "Failure.h"
 #include "IIPMILan.h"
 #include "Output.h"
 #include "Password.h"
@@ -10,10 +11,14 @@
 #include "TLogger.h"
 #include "Text.h"
 
+#include <fcntl.h>
+#include <sys/stat.h>
 #include <unistd.h>
 #include <CLI/CLI.hpp>
 
+#include <cerrno>
 #include <chrono>
+#include <cstring>
 #include <fstream>
 #include <iostream>
 #include <memory>
@@ -65,8 +70,22 @@ private:
   std::chrono::steady_clock::time_point fLast;
 };
 
+// Makes the file for nobody else to read, before the library opens it: it may come to hold passwords. Returns 0 or errno.
+int MakePrivate(std::string const& path) {
+  int const file = ::open(path.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600);
+  struct stat status {};
+  bool const isFile = file >= 0 && ::fstat(file, &status) == 0 && S_ISREG(status.st_mode);  // and no terminal, say
+  bool const isPrivate = file >= 0 && (!isFile || ::fchmod(file, 0600) == 0);
+  int const error = isPrivate ? 0 : errno;
+  if (file >= 0) ::close(file);
+  return error;
+}
+
 void WriteDebugLog(std::string const& path) {
-  TLogger::GetInstance()->SetLogFilename(path);
+  int const error = MakePrivate(path);
+  std::string failure = error != 0 ? std::strerror(error) : "";
+  if (error == 0) failure = FailureOf([&] { TLogger::GetInstance()->SetLogFilename(path); });
+  if (!failure.empty()) throw std::runtime_error("the debug log " + path + " cannot be written: " + failure);
   TLogger::SetLogThreshold(ILogger::kLogDebug);
 }
 
@@ -140,7 +159,8 @@ TRun AddRemoteArguments(CLI::App& command) {
   command.add_option("--timeout", arguments->fTimeoutSeconds, "The time for each host, in seconds")
       ->check(CLI::Range(1, 3600))
       ->capture_default_str();
-  command.add_option("--debug-log", arguments->fDebugLog, "Write what the library logs, debug lines too, to this file");
+  command.add_option("--debug-log", arguments->fDebugLog,
+                     "Write what the library logs, debug lines too, to this file, for its\nowner only");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.footer(
       "Asks the management controller of a server for machine type, model and serial number, over IPMI on the LAN (UDP\n"

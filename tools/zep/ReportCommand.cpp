@@ -88,12 +88,11 @@ TRun AddReportArguments(CLI::App& command) {
                      "[USER@]HOST[:PORT] alone. When it cannot be sent it is kept, and where is said");
   command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
   AddTransferOptions(command, arguments->fOptions);
-  command.allow_extras();  // HasExtras refuses them
   command.footer(
-      "Exit status: 0 when everything could be told, 2 when the report says what is missing, 1 when nothing\n"
-      "could be told or the medium could not be written and unmounted, 64 for wrong usage; when it could not be\n"
-      "sent, as that of zep send.");
-  return [&command, arguments] { return HasExtras(command) ? kExitUsage : Report(*arguments); };
+      "Exit status: 0 when the identity is complete (the details do not count), 2 when something of it is missing or a\n"
+      "plug-in failed, 1 when nothing of it could be told or the medium could not be written and unmounted, 64 for wrong\n"
+      "usage; when it could not be sent, as that of zep send.");
+  return [arguments] { return Report(*arguments); };
 }
 
 }  // namespace NQRVZEP20::zep

@@ -2,6 +2,7 @@
 
 #include "Commands.h"
 #include "ExitStatus.h"
+#include "Failure.h"
 #include "Output.h"
 #include "TOSSpecific.h"
 #include "Text.h"
@@ -26,14 +27,8 @@ std::string WhyItFailed(std::string const& program, int timeout) {
 }
 
 int RunCommandLine(std::vector<std::string> commandLine, int timeout) {
-  if (commandLine.empty()) {
-    std::cerr << "zep: there is no command to run\n";
-    return kExitUsage;
-  }
-  if (commandLine.front().rfind('-', 0) == 0) {
-    std::cerr << "zep: there is no option " << Printable(commandLine.front()) << "\n";
-    return kExitUsage;
-  }
+  if (!commandLine.empty()) commandLine.erase(commandLine.begin());  // kCommandFollows
+  if (commandLine.empty() || commandLine.front().empty()) throw TWrongUsage("there is no command to run");
   std::string const program = commandLine.front();
   commandLine.erase(commandLine.begin());
   std::string output;
@@ -52,7 +47,7 @@ TRun AddRunArguments(CLI::App& command) {
       ->check(CLI::Range(kForEver, std::numeric_limits<int>::max()));
   command.prefix_command();  // all from the first word that is none of the options is the command's
   command.footer(
-      "zep run [OPTIONS] COMMAND [ARGUMENT]...\n"
+      "zep run [OPTIONS] [--] COMMAND [ARGUMENT]...\n"
       "What the command prints, on standard output and standard error, is printed when it has ended. A zero byte\n"
       "cuts off the rest of the chunk in which it came.\n"
       "Exit status: 0 when the command ran to its end and exited with 0, 1 when not, 64 for wrong usage.");

@@ -35,12 +35,11 @@ TRun AddSendArguments(CLI::App& command) {
   command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddTransferOptions(command, arguments->fOptions);
-  command.allow_extras();  // HasExtras refuses them
   command.footer(
       "Missing directories are made on the server; a file that is there is overwritten. A host gets the file in the directory\n"
       "of the user, or, when ZEP_ISBOOTABLE is \"yes\", in hostline/toqrv/vantor/fdr_upload.\n" +
       TransferHelp() + " 2 when the file changed while it was sent.");
-  return [&command, arguments] { return HasExtras(command) ? kExitUsage : Send(*arguments); };
+  return [arguments] { return Send(*arguments); };
 }
 
 }  // namespace NQRVZEP20::zep

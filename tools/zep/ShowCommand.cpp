@@ -2,6 +2,7 @@
 
 #include "Commands.h"
 #include "ExitStatus.h"
+#include "Failure.h"
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
 #include "ICIMMethodDecl.h"
@@ -44,18 +45,33 @@ std::string NamespaceOf(std::string const& path) {
   return end != std::string::npos && path[end] == ':' ? path.substr(0, end) : "";
 }
 
-// What the path names in that namespace; empty when there is no such thing.
-boost::shared_ptr<ICIMElement> Find(TNamespaceView const& view, std::string const& path) {
-  std::string const named = NamespaceOf(path);
-  if (!named.empty() && named != view.GetName()) return {};
+// What has that path, from the text that zep itself prints of an instance: that of a key which is a reference is not to be read.
+boost::shared_ptr<ICIMElement> FindPrinted(TNamespaceView const& view, std::string const& full) {
+  std::string const path = full.substr(view.GetName().size() + 1);
+  std::size_t const dot = path.find('.');
+  if (dot == path.npos) return {};
+  for (auto const& instance : view.InstancesOf(path.substr(0, dot)))
+    if (view.PathOf(*instance) == full) return instance;
+  return {};
+}
+
+boost::shared_ptr<ICIMElement> FindRead(TNamespaceView const& view, std::string const& full) {
   try {
-    std::string const full = named.empty() ? view.GetName() + ":" + path : path;
     return TCIMReference(view.Get(), full, TCIMContext()).GetCIMElement(false);
   } catch (TZEPException const& failure) {
     EZEPStatusCode const status = failure.GetStatusCode().GetCode();
     if (status != kZEPStatusInvalidReference && status != kZEPStatusNotFound) throw;
     return {};
   }
+}
+
+// What the path names in that namespace; empty when there is no such thing.
+boost::shared_ptr<ICIMElement> Find(TNamespaceView const& view, std::string const& path) {
+  std::string const named = NamespaceOf(path);
+  if (!named.empty() && named != view.GetName()) return {};
+  std::string const full = named.empty() ? view.GetName() + ":" + path : path;
+  auto const element = FindRead(view, full);
+  return element ? element : FindPrinted(view, full);
 }
 
 std::string Heading(std::string const& what) {
@@ -238,18 +254,38 @@ std::string ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElem
   return AsText(document);
 }
 
+struct TSearch {
+  std::string fText;      // of what was found; empty when nothing was
+  std::string fFailures;  // a line for each provider that failed
+};
+
+TSearch Search(TArguments const& arguments) {
+  TSearch search;
+  bool const isMof = !arguments.fMofFile.empty();
+  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugIns();
+  search.fFailures = FailuresAsText(plugIns);
+  for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
+    std::string const failure = FailureOf([&] {
+      auto const element = Find(view, arguments.fPath);
+      if (element) search.fText = arguments.fAsJson ? ElementAsJson(view, element) : ElementAsText(view, element);
+    });
+    if (!search.fText.empty()) break;
+    if (!failure.empty()) search.fFailures += Printable("zep: " + view.GetProviderName() + ": " + failure) + "\n";
+  }
+  return search;
+}
+
 int Show(TArguments const& arguments) {
   if (arguments.fSample) SelectSample();
-  bool const isMof = !arguments.fMofFile.empty();
-  auto const views = isMof ? std::vector<TNamespaceView>{ViewOfMof(arguments.fMofFile)} : ViewsOf(LoadPlugIns());
-  for (TNamespaceView const& view : views) {
-    auto const element = Find(view, arguments.fPath);
-    if (!element) continue;
-    WriteOutput(arguments.fAsJson ? ElementAsJson(view, element) : ElementAsText(view, element));
+  TSearch const search = OrFailureDocument("zep show", arguments.fAsJson, [&] { return Search(arguments); });
+  if (!search.fText.empty()) {
+    WriteOutput(search.fText);
     return kExitComplete;
   }
-  std::cerr << "zep: " << (isMof ? Printable(arguments.fMofFile) + " has no" : "no provider has the") << " object \""
-            << Printable(arguments.fPath) << "\"\n";
+  std::string const why = (arguments.fMofFile.empty() ? "no provider has the" : arguments.fMofFile + " has no") + " object \"" +
+                          arguments.fPath + "\"";
+  if (arguments.fAsJson) WriteOutput(FailureAsJson("zep show", why));
+  std::cerr << search.fFailures << "zep: " << Printable(why) << "\n";
   return kExitNothing;
 }
 

@@ -241,12 +241,6 @@ void AddTransferOptions(CLI::App& command, TTransferOptions& options) {
   command.add_option("--netrc", options.fNetrc, "The file with users and passwords ($NETRC, else ~/.netrc)");
 }
 
-bool HasExtras(CLI::App const& command) {
-  if (command.remaining().empty()) return false;
-  std::cerr << "zep: there are arguments too many, or options that do not exist\n";
-  return true;
-}
-
 std::string TransferHelp() {
   return "Passwords come from the URL (which other users may see in the list of processes), from netrc, or from a prompt.\n"
          "In the path of a URL blanks and the like may be written as they are; \"%20\" stays what it is.\n"

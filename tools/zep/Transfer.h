@@ -23,10 +23,6 @@ struct TTransferOptions {
 
 void AddTransferOptions(CLI::App& command, TTransferOptions& options);
 
-// Whether there are arguments that the command does not know, which it says then without showing them: a password may be
-// among them.
-bool HasExtras(CLI::App const& command);
-
 // The end of the help of such a command: passwords, and the exit status for each kind of failure.
 std::string TransferHelp();
 

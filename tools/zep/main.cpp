@@ -3,20 +3,25 @@
 #include "Commands.h"
 #include "ExitStatus.h"
 #include "Failure.h"
+#include "Output.h"
 #include "Text.h"
 
 #include <CLI/CLI.hpp>
 
 #include <algorithm>
+#include <cctype>
 #include <exception>
 #include <iostream>
 #include <map>
+#include <sstream>
 #include <string>
 #include <vector>
 
 namespace NQRVZEP20::zep {
 
 namespace {
+
+constexpr char const* kIsEmpty = " is given but empty";
 
 constexpr TCommand kCommands[] = {
     {"report", "Tell which machine this is", AddReportArguments},
@@ -33,18 +38,109 @@ constexpr TCommand kCommands[] = {
     {"wpad", "Find the proxy configuration file that the DHCP server names", AddWpadArguments},
 };
 
-// The arguments, the last one first, as CLI11 takes them. It would hand what stands behind "--" to zep itself: of
-// "zep run [OPTIONS] -- COMMAND" the mark is left out, and the command begins all the same.
+// The option's own name: of "--name=value" and "-nvalue" without the value.
+std::string NameOfOption(std::string const& word) {
+  return word.rfind("--", 0) == 0 ? word.substr(0, word.find('=')) : word.substr(0, 2);
+}
+
+// How many of the words zep reads as options and the like. What stands behind "--" is none, and of "zep run [OPTIONS] COMMAND"
+// neither is the command.
+std::size_t WordsOfZep(std::vector<std::string> const& words) {
+  bool const isRun = !words.empty() && words.front() == "run";
+  std::size_t at = isRun ? 1 : 0;
+  while (at < words.size() && words[at] != "--" && (!isRun || words[at].rfind('-', 0) == 0))
+    at += isRun && words[at] == "--timeout" && at + 1 < words.size() ? 2 : 1;
+  return at;
+}
+
+// The arguments, the last one first, as CLI11 takes them. It would take "--send=" for one whose value is the next word, and
+// what stands behind the "--" of "zep run" for options.
 std::vector<std::string> ArgumentsOf(int argc, char const* const* argv) {
-  std::vector<std::string> arguments(argv + 1, argv + argc);
-  if (!arguments.empty() && arguments.front() == "run") {
-    auto word = arguments.begin() + 1;
-    while (word != arguments.end() && word->rfind('-', 0) == 0 && *word != "--")
-      word += *word == "--timeout" && word + 1 != arguments.end() ? 2 : 1;
-    if (word != arguments.end() && *word == "--") arguments.erase(word);
+  std::vector<std::string> words(argv + 1, argv + argc);
+  std::size_t const end = WordsOfZep(words);
+  for (std::size_t at = 0; at < end; ++at)
+    if (words[at].rfind("--", 0) == 0 && words[at].find('=') == words[at].size() - 1)
+      throw TWrongUsage(NameOfOption(words[at]) + kIsEmpty);
+  if (end < words.size() && words.front() == "run") {
+    if (words[end] == "--") words.erase(words.begin() + static_cast<std::ptrdiff_t>(end));
+    words.insert(words.begin() + static_cast<std::ptrdiff_t>(end), kCommandFollows);
   }
-  std::reverse(arguments.begin(), arguments.end());
-  return arguments;
+  std::reverse(words.begin(), words.end());
+  return words;
+}
+
+// The command, or the command of a command, that the words name.
+CLI::App const& ChosenOf(CLI::App const& app) {
+  auto const chosen = app.get_subcommands();
+  return chosen.empty() ? app : ChosenOf(*chosen.front());
+}
+
+void CheckForEmpty(CLI::App const& app) {
+  for (CLI::Option const* const option : app.get_options())
+    for (std::string const& value : option->results())
+      if (value.empty()) throw TWrongUsage(option->get_name() + kIsEmpty);
+  for (CLI::App const* const chosen : app.get_subcommands()) CheckForEmpty(*chosen);
+}
+
+// The words that nothing takes.
+std::vector<std::string> ExtrasOf(CLI::App const& app) {
+  std::vector<std::string> words = app.remaining(true);
+  if (app.got_subcommand("run")) words.erase(std::find(words.begin(), words.end(), kCommandFollows), words.end());
+  words.erase(std::remove(words.begin(), words.end(), "--"), words.end());
+  return words;
+}
+
+bool IsOption(std::string const& word) { return word.size() > 1 && word.front() == '-'; }
+
+bool HasOnlyLetters(std::string const& word) {
+  return std::all_of(word.begin(), word.end(), [](unsigned char c) { return std::isalpha(c) != 0; });
+}
+
+// A word that zep does not know may be a password, and is not said.
+void CheckForExtras(CLI::App const& app) {
+  std::vector<std::string> const words = ExtrasOf(app);
+  if (words.empty()) return;
+  bool const isCommand = !ChosenOf(app).get_subcommands({}).empty() && !IsOption(words.front());
+  if (isCommand && HasOnlyLetters(words.front())) throw TWrongUsage("there is no command \"" + words.front() + "\"");
+  if (isCommand) throw TWrongUsage("there is no such command");
+  auto const option = std::find_if(words.begin(), words.end(), IsOption);
+  if (option != words.end()) throw TWrongUsage("there is no option " + NameOfOption(*option));
+  throw TWrongUsage(words.size() == 1 ? "there is one argument too many"
+                                      : "there are " + std::to_string(words.size()) + " arguments too many");
+}
+
+// CLI11 says these three when an option does not take its value, with the value.
+bool IsAbout(std::string const& message, std::string const& option) {
+  std::string const end = " is not an allowed value for " + option;
+  return message.rfind(option + ": ", 0) == 0 || message.rfind("Could not convert: " + option + " = ", 0) == 0 ||
+         (message.size() > end.size() && message.compare(message.size() - end.size(), end.size(), end) == 0);
+}
+
+std::string WhyNoValue(CLI::App const& chosen, std::string const& message) {
+  for (CLI::Option const* const option : chosen.get_options())
+    if (IsAbout(message, option->get_name())) {
+      std::string const type = option->get_type_name();  // "INT:INT in [1 - 1000]"
+      return option->get_name() + " takes " + (type.empty() ? "no value" : type.substr(type.find(':') + 1));
+    }
+  return "an option does not take its value";
+}
+
+// What CLI11 says is the name of the option, or the command, with words of its own, but for values.
+std::string WhyRefused(CLI::App const& app, CLI::ParseError const& refusal) {
+  CLI::App const& chosen = ChosenOf(app);
+  std::string const message = refusal.what();
+  if (&chosen == &app && dynamic_cast<CLI::RequiredError const*>(&refusal)) return "no command is named; zep --help lists them";
+  bool const isOfValue =
+      dynamic_cast<CLI::ValidationError const*>(&refusal) || dynamic_cast<CLI::ConversionError const*>(&refusal);
+  return isOfValue ? WhyNoValue(chosen, message) : message;
+}
+
+// Help and version are written like any other output.
+int Answer(CLI::App const& app, CLI::Success const& question) {
+  std::ostringstream answer;
+  app.exit(question, answer, answer);
+  WriteOutput(answer.str());
+  return kExitComplete;
 }
 
 int Run(int argc, char const* const* argv) {
@@ -61,15 +157,15 @@ int Run(int argc, char const* const* argv) {
 
   try {
     app.parse(ArgumentsOf(argc, argv));
-  } catch (CLI::ExtrasError const& stop) {
-    bool const maySayPassword = std::string(stop.what()).find('@') != std::string::npos;
-    if (maySayPassword) throw TWrongUsage("there are arguments too many");
-    app.exit(stop, std::cout, std::cerr);
-    return kExitUsage;
-  } catch (CLI::ParseError const& stop) {
-    bool const isAnswered = app.exit(stop, std::cout, std::cerr) == 0;  // --help, --version
-    return isAnswered ? kExitComplete : kExitUsage;
+  } catch (CLI::Success const& question) {
+    return Answer(app, question);
+  } catch (CLI::ParseError const& refusal) {
+    CheckForEmpty(app);
+    CheckForExtras(app);
+    throw TWrongUsage(WhyRefused(app, refusal));
   }
+  CheckForEmpty(app);
+  CheckForExtras(app);
   return runs.at(app.get_subcommands().front())();
 }
 

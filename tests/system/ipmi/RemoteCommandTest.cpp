@@ -79,9 +79,10 @@ class ZepRemoteTest : public RemoteSystemTest {
 protected:
   ZepRemoteTest() { zep_.Add("libipmiClient.so", TEST_LIB_DIR "/libipmiClient.so"); }
 
-  zep::TRun Run(std::vector<std::string> arguments, std::string const& password = "zeppass1") {
+  zep::TRun Run(std::vector<std::string> arguments, std::string const& password = "zeppass1",
+                std::string const& user = "zepadmin") {
     arguments.insert(arguments.begin(), "remote");
-    arguments.insert(arguments.end(), {"--user", "zepadmin"});
+    arguments.insert(arguments.end(), {"--user", user});
     zep::TCall call = {arguments};
     call.environment = {{"ZEP_BMC_PASSWORD", password}};
     call.hasNoTerminal = true;
@@ -107,6 +108,8 @@ TEST_F(ZepRemoteTest, TellsTypeModelAndSerialNumber) {
 
   WriteFile(dir_.Path("password"), "zeppass1\nnot this line");
   EXPECT_EQ(Run({"127.0.0.1", "--password-file", dir_.Path("password")}, "wrong").status, 0) << "the file counts first";
+  WriteFile(dir_.Path("password"), "zeppass1\r\n");
+  EXPECT_EQ(Run({"127.0.0.1", "--password-file", dir_.Path("password")}, "wrong").status, 0) << "of another system's editor";
 }
 
 TEST_F(ZepRemoteTest, ARefusedAccountTellsNothing) {
@@ -114,8 +117,18 @@ TEST_F(ZepRemoteTest, ARefusedAccountTellsNothing) {
   simulator.WaitUntilReady();
   zep::TRun const run = Run({"127.0.0.1"}, "secret7");
   EXPECT_EQ(run.status, 1);
-  EXPECT_THAT(run.errors, HasSubstr("zep: 127.0.0.1: no session with its controller after 0.0 s"));
+  EXPECT_THAT(run.errors, HasSubstr("zep: 127.0.0.1: no session with its controller after 0.0 s: it refuses the password\n"));
   EXPECT_EQ((run.output + run.errors).find("secret7"), std::string::npos);
+}
+
+TEST_F(ZepRemoteTest, WhyThereIsNoSessionIsTold) {
+  TSimulator simulator({});
+  simulator.WaitUntilReady();
+  EXPECT_THAT(Run({"127.0.0.1"}, "zeppass1", "nobody").errors,
+              HasSubstr(" s: it knows no such user, or the account is disabled\n"));
+  EXPECT_THAT(Run({"no-such-host.invalid"}).errors, HasSubstr(" s: the host name has no address\n"));
+  EXPECT_THAT(Run({"198.51.100.1"}).errors, HasSubstr(" s: nothing can be sent there\n"));
+  EXPECT_THAT(Run({"127.0.0.2"}).errors, HasSubstr(" s: it gives no answer\n"));
 }
 
 TEST_F(ZepRemoteTest, WhatIsMissingIsTold) {

@@ -110,11 +110,6 @@ TEST_F(ConfigTest, SaysWhyThereIsNothing) {
   EXPECT_EQ(run.output, "");
   EXPECT_EQ(run.errors, "zep: " + File() + " does not set \"b\"\n");
 
-  run = Run({""});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: " + File() + " does not set \"\"\n");
-
   fs::permissions(dir_.Path(), fs::perms::all);
   fs::permissions(File(), fs::perms::none);
   run = Run({"--json"}, true);

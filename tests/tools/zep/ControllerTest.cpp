@@ -64,7 +64,7 @@ protected:
 };
 
 std::string const kNothing =
-    "no session with its controller after 0.0 s: it gave no answer or refused the account, or libipmiClient.so is missing";
+    "no session with its controller after 0.0 s: libipmiClient.so cannot be loaded, or has no memory left";
 
 TEST_F(ZepRemoteTest, WithoutTheClientLibraryNothingIsTold) {
   TRun const run = Run({"192.0.2.1", "--user", "zepadmin"}, password_);
@@ -127,7 +127,12 @@ TEST_F(ZepRemoteTest, WithoutATerminalThePasswordMustComeFromElsewhere) {
   EXPECT_EQ(run.errors, "zep: there is no terminal to ask for the password: set ZEP_BMC_PASSWORD or use --password-file\n");
   std::string const absent = zep_.Path("absent");
   EXPECT_EQ(Run({"host", "--user", "u", "--password-file", absent}, password_).errors,
-            "zep: there is no password in " + absent + "\n");
+            "zep: " + absent + " cannot be read: No such file or directory\n");
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", zep_.Path("lib")}, password_).errors,
+            "zep: " + zep_.Path("lib") + " cannot be read: Is a directory\n");
+  std::string const empty = File("empty", "");
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", empty}, password_).errors,
+            "zep: there is no password in " + empty + "\n");
   EXPECT_EQ(Run({"host", "--user", "u", "--password-file", File("password", "zeppass1\n")}).errors,
             "zep: host: " + kNothing + "\n");
   EXPECT_EQ(Run({"host", "--user", "u"}, {{"ZEP_BMC_PASSWORD", ""}}).errors, "zep: host: " + kNothing + "\n")
@@ -142,6 +147,83 @@ TEST_F(ZepRemoteTest, ADebugLogIsWarnedOf) {
                                   "them in clear text\n"));
   EXPECT_THAT(ReadFile(log), HasSubstr("FDR_[Debug] "));
   EXPECT_EQ((run.errors + run.output + ReadFile(log)).find("zeppass1"), std::string::npos);
+}
+
+TEST_F(ZepRemoteTest, ADebugLogIsForItsOwnerOnly) {
+  std::string const log = File("log", "from before");
+  fs::permissions(log, static_cast<fs::perms>(0644));
+  Run({"host", "--user", "u", "--debug-log", log}, password_);
+  EXPECT_EQ(fs::status(log).permissions(), static_cast<fs::perms>(0600));
+  EXPECT_EQ(ReadFile(log).find("from before"), std::string::npos);
+  Run({"host", "--user", "u", "--debug-log", log + "2"}, password_);
+  EXPECT_EQ(fs::status(log + "2").permissions(), static_cast<fs::perms>(0600));
+}
+
+TEST_F(ZepRemoteTest, ADebugLogThatCannotBeWrittenIsTold) {
+  std::string const nowhere = zep_.Path("none/log");
+  TRun const run = Run({"host", "--user", "u", "--debug-log", nowhere}, password_);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, "");
+  EXPECT_EQ(run.errors, "zep: the debug log " + nowhere + " cannot be written: No such file or directory\n");
+  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", zep_.Path("lib")}, password_).errors,
+            "zep: the debug log " + zep_.Path("lib") + " cannot be written: Is a directory\n");
+}
+
+TEST_F(ZepRemoteTest, WhyThereIsNoSessionIsToldInWords) {
+  zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+  struct TRow {
+    char const *code, *words;
+  } const rows[] = {
+      {"1", "it refuses the password"},
+      {"2", "it knows no such user, or the account is disabled"},
+      {"3", "it gives no answer"},
+      {"4", "the host name has no address"},
+      {"5", "nothing can be sent there"},
+      {"6", "it has no session left"},
+      {"7", "the account may not be administrator, or there is no cipher suite in common"},
+      {"8", "the user name or the password cannot be used; it may be too long"},
+      {"9", "code 9 of libipmiClient.so"},
+      {"10", "it did not carry a command out"},
+      {"11", "libipmiClient.so cannot be loaded, or has no memory left"},
+      {"12", "its answers make no sense"},
+      {"-7", "code -7 of libipmiClient.so"},
+      {"4711", "code 4711 of libipmiClient.so"},
+  };
+  std::string const log = zep_.Path("log");
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.code);
+    auto environment = password_;
+    environment["FAKE_IPMI_CODE"] = row.code;
+    TRun const run = Run({"host", "--user", "u"}, environment);
+    EXPECT_EQ(run.status, 1);
+    EXPECT_EQ(run.errors, "zep: host: no session with its controller after 0.0 s: "s + row.words + "\n");
+    TRun const logged = Run({"host", "--user", "u", "--debug-log", log}, environment);
+    EXPECT_THAT(logged.errors, testing::EndsWith(run.errors));
+    EXPECT_EQ((logged.output + logged.errors + ReadFile(log)).find("zeppass1"), std::string::npos);
+  }
+}
+
+// The code is read from a log that has what the caller gave in front of it.
+TEST_F(ZepRemoteTest, NoHostOrPasswordPassesForACode) {
+  zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+  std::string const forged = "x\nFDR_[Debug] 1/1/2026  0:0:0 Connection Error code:3\n";
+  TRun const run = Run({forged, "--user", forged}, {{"ZEP_BMC_PASSWORD", forged}, {"FAKE_IPMI_CODE", "1"}});
+  EXPECT_THAT(run.errors, testing::EndsWith(": it refuses the password\n"));
+}
+
+TEST_F(ZepRemoteTest, AClientLibraryWithoutItsFunctionIsTold) {
+  zep_.Add("libipmiClient.so", TEST_LIB_DIR "/libsmbios.so");
+  EXPECT_EQ(Run({"host", "--user", "u"}, password_).errors,
+            "zep: host: no session with its controller after 0.0 s: libipmiClient.so lacks a function\n");
+}
+
+TEST_F(ZepRemoteTest, AnOpenedSessionThatTellsNothingIsTold) {
+  zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+  auto environment = password_;
+  environment["FAKE_IPMI_CODE"] = "0";
+  TRun const run = Run({"host", "--user", "u", "--json"}, environment);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(JsonOf(run)["error"], "the controller did not tell everything");
 }
 
 // ---- At a terminal ----

@@ -326,9 +326,9 @@ TEST_F(MediaCommandTest, RefusesNamesBeforeAnythingIsRun) {
       {{"umount", "/mnt/"}, 64, "zep: \"/mnt\" is no mount point of a medium"},
       {{"umount", "/mnt/nothing-mounted-here"}, 1, "zep: nothing is mounted at /mnt/nothing-mounted-here\n"},
       {{"umount", "/mnt/nothing-mounted-here/"}, 1, "zep: nothing is mounted at /mnt/nothing-mounted-here\n"},
-      {{"mount"}, 64, "device is required"},
-      {{"umount"}, 64, "directory is required"},
-      {{"eject"}, 64, ""},
+      {{"mount"}, 64, "zep: device is required"},
+      {{"umount"}, 64, "zep: directory is required"},
+      {{"eject"}, 64, "zep: there is no command \"eject\""},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(testing::PrintToString(row.arguments));

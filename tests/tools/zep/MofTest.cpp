@@ -225,6 +225,24 @@ TEST_F(MofTest, WhatTheFileDoesNotDeclareIsAnError) {
   EXPECT_EQ(run.errors, "zep: disks.mof has no object \"X_Tape\"\n");
 }
 
+TEST_F(MofTest, AFailureIsADocumentToo) {
+  std::vector<std::vector<std::string>> const calls = {
+      {"mof", "--json", "none.mof"}, {"classes", "--json", "--mof", "none.mof"}, {"show", "--json", "X", "--mof", "none.mof"}};
+  std::string const why = "none.mof: cannot be read: No such file or directory";
+  for (auto const& call : calls) {
+    SCOPED_TRACE(call.front());
+    TRun const run = Run(call);
+    EXPECT_EQ(run.status, 1);
+    EXPECT_EQ(run.errors, "zep: " + why + "\n");
+    EXPECT_EQ(JsonOf(run), (nlohmann::json{{"document", "zep " + call.front()},
+                                           {"version", 1},
+                                           {"zep", TEST_VERSION},
+                                           {"sample", false},
+                                           {"exitStatus", 1},
+                                           {"reason", why}}));
+  }
+}
+
 // ---- The documentation ----
 
 // The blocks of docs/schemas.md that begin with "$ zep", each with its first line.

@@ -448,6 +448,15 @@ TEST_F(ReportTest, AProviderThatFailsIsToldAndStopsNoOther) {
   }
 }
 
+TEST_F(ReportTest, WhatTheLogSaysOfAFailureIsToldWithIt) {
+  TRun const run = RunWithTestProvider("is-refused", {"--json"});
+  EXPECT_EQ(run.status, 2);
+  std::string const error = JsonOf(run)["plugIns"][1]["providers"][0]["error"];
+  EXPECT_EQ(error, "kZEPStatusTypeMismatch (X_Refused.Kind refused: kZEPStatusTypeMismatch)");
+  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(RunWithTestProvider("is-refused").output)[1][2]),
+            WithoutBlanks("provider Test failed: " + error));
+}
+
 TEST_F(ReportTest, ANamespaceThatFailsLaterIsToldWhereItFails) {
   zep_.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("fails-later");

@@ -47,6 +47,15 @@ TEST_F(RunTest, AMarkMayStandBeforeTheCommand) {
   EXPECT_EQ(Run({"--timeout", "5", "--", "sh", "-c", "echo b"}).output, "b\n");
   EXPECT_EQ(Run({"echo", "--", "c"}).output, "-- c\n");
   EXPECT_EQ(Run({"--"}).status, 64);
+  EXPECT_EQ(Run({"echo", "command:", "", "--x="}).output, "command:  --x=\n");
+}
+
+TEST_F(RunTest, WhatFollowsTheMarkIsTheCommandWhateverItLooksLike) {
+  for (std::string const program : {"-x", "--timeout", "--help", "--", "--x="}) {
+    TRun const run = Run({"--", program, "--help"});
+    EXPECT_EQ(run.status, 1);
+    EXPECT_EQ(run.errors, "zep: " + program + " could not be executed, did not exit with 0 or was ended by a signal\n");
+  }
 }
 
 TEST_F(RunTest, TellsThatACommandFailed) {
@@ -81,6 +90,7 @@ TEST_F(RunTest, WithoutACommandOrWithAnOddTimeoutItIsWrongUsage) {
   EXPECT_EQ(run.status, 64);
   EXPECT_EQ(run.errors, "zep: there is no command to run\n");
   for (char const* timeout : {"-2", "x", "99999999999"}) EXPECT_EQ(Run({"--timeout", timeout, "true"}).status, 64) << timeout;
+  EXPECT_EQ(Run({"--", ""}).errors, "zep: there is no command to run\n");
   TRun const unknown = Run({"--unknown", "true"});
   EXPECT_EQ(unknown.status, 64);
   EXPECT_EQ(unknown.errors, "zep: there is no option --unknown\n");

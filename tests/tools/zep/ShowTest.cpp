@@ -5,6 +5,8 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <algorithm>
+
 namespace NQRVZEP20::zep {
 namespace {
 
@@ -15,10 +17,10 @@ class ShowTest : public testing::Test {
 protected:
   ShowTest() { zep_.Add("libTest.nsp.so", TEST_PROVIDER); }
 
-  TRun Run(std::vector<std::string> const& arguments) {
+  TRun Run(std::vector<std::string> const& arguments, std::string const& behaviour = "odd") {
     TCall call;
     call.arguments = arguments;
-    call.environment = {{"ZEP_SMBIOS_TABLE", SamplePath()}, {"ZEP_HOST_NAME", "db1"}, {"ZEP_TEST_PROVIDER", "odd"}};
+    call.environment = {{"ZEP_SMBIOS_TABLE", SamplePath()}, {"ZEP_HOST_NAME", "db1"}, {"ZEP_TEST_PROVIDER", behaviour}};
     return zep_.Run(call);
   }
 
@@ -105,12 +107,58 @@ TEST_F(ShowTest, AReferenceIsShownAsItsPath) {
 TEST_F(ShowTest, WhatIsNotThereIsAnError) {
   for (std::string const path :
        {"CIM_Nothing", "root/zep/host:CIM_Nothing", "root/other:CIM_Chassis", "CIM_Chassis.Tag=\"Chassis 7\"",
-        "CIM_Chassis.Nothing=\"1\"", "CIM_Chassis.Tag=", "", ":", "root/zep/host:", "\"", "CIM_Chassis.Tag=\"a"}) {
+        "CIM_Chassis.Nothing=\"1\"", "CIM_Chassis.Tag=", ":", "root/zep/host:", "\"", "CIM_Chassis.Tag=\"a"}) {
     TRun const run = Run({"show", path});
     EXPECT_EQ(run.status, 1) << path;
     EXPECT_EQ(run.output, "") << path;
     EXPECT_EQ(run.errors, "zep: no provider has the object \"" + path + "\"\n");
   }
+}
+
+TEST_F(ShowTest, AnObjectWhoseKeysAreReferencesIsFoundByItsPrintedPath) {
+  zep_.Add("libClock.nsp.so", CLOCK_PLUGIN);
+  std::string const path = "X_RunsAtTheRateOf.Follower=\"X_Clock.Name=\"monotonic\"\",Leader=\"X_Clock.Name=\"realtime\"\"";
+  auto const instances = JsonOf(Run({"report", "--json"}))["instances"];
+  EXPECT_TRUE(std::any_of(instances.begin(), instances.end(),
+                          [&](auto const& instance) { return instance["path"] == "root/clock:" + path; }));
+  for (std::string const& given : {"root/clock:" + path, path}) {
+    TRun const run = Run({"show", given, "--json"});
+    EXPECT_EQ(run.status, 0) << run.errors;
+    if (run.status != 0) continue;
+    EXPECT_EQ(JsonOf(run)["object"]["path"], "root/clock:" + path);
+    EXPECT_EQ(JsonOf(run)["object"]["properties"]["Leader"]["value"], "X_Clock.Name=\"realtime\"");
+  }
+  EXPECT_EQ(Run({"show", "root/test:" + path}).status, 1);
+  EXPECT_EQ(Run({"show", "root/clock:X_RunsAtTheRateOf.Follower=\"X_Clock.Name=\"monotonic\"\""}).status, 1);
+}
+
+TEST_F(ShowTest, AProviderThatFailedIsNamed) {
+  std::string const nothing = "zep: no provider has the object \"X_Odd\"\n";
+  EXPECT_EQ(Run({"show", "X_Odd"}, "throws").errors, "zep: Test: kZEPStatusAccessDenied\n" + nothing);
+  EXPECT_EQ(Run({"show", "X_Odd"}, "fails-later").errors, "zep: Test: kZEPStatusFail\n" + nothing);
+  WriteFile(zep_.Path("lib/libBroken.nsp.so"), "this is no library");
+  EXPECT_EQ(Run({"show", "X_None"}).errors, "zep: Broken: " + zep_.Path("bin/../lib/libBroken.nsp.so") +
+                                                ": file too short\nzep: no provider has the object \"X_None\"\n");
+  TRun const run = Run({"show", "X_Odd"});
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.errors, "");
+}
+
+TEST_F(ShowTest, ClassesNamesANamespaceThatFailsAndShowsTheOthers) {
+  TRun const run = Run({"classes", "--json"}, "fails-later");
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(run.errors, "zep: Test: it threw something that is no exception of the standard library\n");
+  EXPECT_EQ(JsonOf(run)["namespaces"].size(), 1u);
+}
+
+TEST_F(ShowTest, WhatIsNotThereIsADocumentToo) {
+  TRun const run = Run({"show", "X_None", "--json"});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors, "zep: no provider has the object \"X_None\"\n");
+  EXPECT_EQ(JsonOf(run)["document"], "zep show");
+  EXPECT_EQ(JsonOf(run)["version"], 1);
+  EXPECT_EQ(JsonOf(run)["exitStatus"], 1);
+  EXPECT_EQ(JsonOf(run)["reason"], "no provider has the object \"X_None\"");
 }
 
 TEST_F(ShowTest, TheSampleIsLabelled) {

@@ -72,11 +72,17 @@ void AddOddities(TMemoryNamespace& ns) {
   ns.AddInstance("X_Link", {{"Id", "1"}, {"Target", odd->GetReference()}});
 }
 
+void AddRefused(TMemoryNamespace& ns) {
+  ns.DefineClass("X_Refused").Key("Id", "string").Property("Kind", "uint16");
+  ns.AddInstance("X_Refused", {{"Id", "1"}, {"Kind", "no number"}});
+}
+
 void Fill(TMemoryNamespace& ns) {
   if (Does("prints")) std::printf("noise while filling\n");
   if (Does("throws")) throw TZEPException(kZEPStatusAccessDenied);
   if (Does("throws-a-number")) throw 5;
   if (Does("two-systems") || Does("one-system")) AddSystems(ns);
+  if (Does("is-refused")) AddRefused(ns);
   if (Does("odd")) AddOddities(ns);
 }
 

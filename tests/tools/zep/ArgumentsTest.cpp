@@ -1,0 +1,141 @@
+// What zep says of a command line that it does not take, for every command.
+
+#include "tests/tools/zep/Zep.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+class ArgumentsTest : public testing::Test {
+protected:
+  TRun Run(std::vector<std::string> const& arguments) {
+    TCall call = {arguments};
+    call.hasNoTerminal = true;
+    return zep_.Run(call);
+  }
+
+  TInstallation zep_;
+};
+
+TEST_F(ArgumentsTest, WhatIsWrongIsSaidWithoutTheWordsOfTheCommandLine) {
+  struct TRow {
+    std::vector<std::string> arguments;
+    std::string errors;
+  };
+  TRow const rows[] = {
+      {{"remote", "h", "--user", "u", "--password", "SECRET1"}, "there is no option --password"},
+      {{"remote", "h", "--user", "u", "--password=SECRET1"}, "there is no option --password"},
+      {{"remote", "h", "--user", "u", "-pSECRET1"}, "there is no option -p"},
+      {{"remote", "h", "SECRET1", "--user", "u"}, "there is one argument too many"},
+      {{"remote", "h", "SECRET1", "SECRET1", "--user", "u"}, "there are 2 arguments too many"},
+      {{"remote", "h", "--user", "u", "--parallel", "SECRET1"}, "--parallel takes INT in [1 - 1000]"},
+      {{"remote", "h", "--user", "u", "--parallel", "1001"}, "--parallel takes INT in [1 - 1000]"},
+      {{"remote", "h", "--user"}, "--user: 1 required TEXT missing"},
+      {{"remote", "h"}, "--user is required"},
+      {{"send", "--stall", "ftp://u:SECRET1@h/x", "f", "h"}, "--stall takes INT in [0 - 86400]"},
+      {{"send", "f", "h", "ftp://u:SECRET1@h/x"}, "there is one argument too many"},
+      {{"send", "f", "--", "h", "ftp://u:SECRET1@h/x"}, "there is one argument too many"},
+      {{"report", "--json=SECRET1"}, "--json takes no value"},
+      {{"report", "--send", "SECRET1", "--send", "h"}, "--send: At Most 1 required but received 2"},
+      {{"run", "--password=SECRET1", "true"}, "there is no option --password"},
+      {{"run", "--timeout", "SECRET1", "true"}, "--timeout takes INT in [-1 - 2147483647]"},
+      {{"show", "a", "--mof", "SECRET1", "--sample"}, "--mof excludes --sample"},
+      {{"show"}, "path is required"},
+      {{"SECRET1"}, "there is no such command"},
+      {{"ftp://u:SECRET1@h/x"}, "there is no such command"},
+      {{"--password", "SECRET1"}, "there is no option --password"},
+      {{"--password=SECRET1", "report"}, "there is no option --password"},
+      {{"media", "SECRET1"}, "there is no such command"},
+      {{"media", "mount", "/dev/sdz", "SECRET1"}, "there is one argument too many"},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(testing::PrintToString(row.arguments));
+    TRun const run = Run(row.arguments);
+    EXPECT_EQ(run.status, 64);
+    EXPECT_EQ(run.output, "");
+    EXPECT_EQ(run.errors, "zep: " + row.errors + "\n");
+  }
+}
+
+TEST_F(ArgumentsTest, ACommandThatThereIsNotIsNamed) {
+  EXPECT_EQ(Run({"bogus"}).errors, "zep: there is no command \"bogus\"\n");
+  EXPECT_EQ(Run({"bogus", "--json"}).errors, "zep: there is no command \"bogus\"\n");
+  EXPECT_EQ(Run({"media", "eject"}).errors, "zep: there is no command \"eject\"\n");
+  EXPECT_EQ(Run({}).errors, "zep: no command is named; zep --help lists them\n");
+}
+
+TEST_F(ArgumentsTest, NothingOfItReachesTheTerminalRaw) {
+  for (std::vector<std::string> const& arguments : {std::vector<std::string>{"\x1b[2J"},
+                                                    {"--\x1b[2J"},
+                                                    {"show", "a", "\x1b[2J"},
+                                                    {"show", "a", "--\x1b[2J"},
+                                                    {"run", "-\x1b", "true"},
+                                                    {"remote", "h", "--user", "u", "--timeout", "\x1b[2J"}}) {
+    SCOPED_TRACE(testing::PrintToString(arguments));
+    TRun const run = Run(arguments);
+    EXPECT_EQ(run.status, 64);
+    EXPECT_THAT(run.errors, testing::StartsWith("zep: "));
+    EXPECT_EQ(run.errors.find('\x1b'), std::string::npos);
+  }
+  EXPECT_EQ(Run({"show", "a", "--\x1b[2J"}).errors, "zep: there is no option --\\x1b[2J\n");
+}
+
+TEST_F(ArgumentsTest, WhatIsGivenIsNotEmpty) {
+  struct TRow {
+    std::vector<std::string> arguments;
+    std::string name;
+  };
+  TRow const rows[] = {
+      {{"report", "--send", ""}, "--send"},
+      {{"report", "--send="}, "--send"},
+      {{"report", "--to-media", ""}, "--to-media"},
+      {{"report", "--netrc", ""}, "--netrc"},
+      {{"show", "--mof", "", "X"}, "--mof"},
+      {{"show", ""}, "path"},
+      {{"classes", "--mof", ""}, "--mof"},
+      {{"mof", ""}, "file"},
+      {{"media", "mount", ""}, "device"},
+      {{"media", "umount", ""}, "directory"},
+      {{"config", ""}, "key"},
+      {{"remote", "", "--user", "u"}, "host"},
+      {{"remote", "h", "--user", ""}, "--user"},
+      {{"remote", "--user", "u", "--hosts", ""}, "--hosts"},
+      {{"remote", "h", "--user", "u", "--debug-log", ""}, "--debug-log"},
+      {{"remote", "h", "--user", "u", "--password-file", ""}, "--password-file"},
+      {{"remote", "h", "--user", "u", "--timeout", ""}, "--timeout"},
+      {{"remote", "h", "--user=", "u"}, "--user"},
+      {{"run", "--timeout=", "5", "true"}, "--timeout"},
+      {{"send", "", "h"}, "file"},
+      {{"send", "f", ""}, "target"},
+      {{"send", "f", "h", "--as", ""}, "--as"},
+      {{"get", "ftp://h/f", ""}, "file"},
+      {{"proxy-check", ""}, "proxy"},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(testing::PrintToString(row.arguments));
+    TRun const run = Run(row.arguments);
+    EXPECT_EQ(run.status, 64);
+    EXPECT_EQ(run.output, "");
+    EXPECT_EQ(run.errors, "zep: " + row.name + " is given but empty\n");
+  }
+}
+
+TEST_F(ArgumentsTest, HelpThatCannotBeWrittenIsAFailure) {
+  for (std::vector<std::string> const& arguments :
+       {std::vector<std::string>{"--help"}, {"report", "--help"}, {"media", "mount", "--help"}, {"--version"}}) {
+    SCOPED_TRACE(testing::PrintToString(arguments));
+    TCall call = {arguments};
+    call.outputFile = "/dev/full";
+    TRun const run = zep_.Run(call);
+    EXPECT_EQ(run.status, 1);
+    EXPECT_EQ(run.errors, "zep: standard output cannot be written: No space left on device\n");
+    TRun const written = Run(arguments);
+    EXPECT_EQ(written.status, 0);
+    EXPECT_NE(written.output, "");
+  }
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep
