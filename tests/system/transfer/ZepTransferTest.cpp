@@ -297,8 +297,7 @@ TEST_F(ZepTransferTest, AFullDiskIsNamed) {
     return std::to_string(run.exitCode) + run.output + (fs::exists(dir_.Path("small/f")) ? "looks complete" : "");
   });
   EXPECT_THAT(outcome, testing::StartsWith("73zep: ftp://zep@"));
-  EXPECT_THAT(outcome,
-              HasSubstr("No space left on device; the 64 KiB that arrived are in " + dir_.Path("small/f.part") + "\n"));
+  EXPECT_THAT(outcome, HasSubstr("No space left on device; the 64 KiB that arrived are in " + dir_.Path("small/f.part") + "\n"));
   EXPECT_THAT(outcome, Not(HasSubstr("looks complete")));
 }
 
@@ -532,9 +531,9 @@ TEST(ZepReportTest, IsSentPacked) {
   std::string const host = server.Host(), command = "TMPDIR=" + dir.Path() + " " + kZep + "report --sample --sftp --send " + host;
   TProgramRun const run = RunProgram(command + " < /dev/null 2>&1 > " + dir.Path("printed"));
   EXPECT_EQ(run.exitCode, RunProgram(kZep + "report --sample > /dev/null").exitCode) << run.output;
-  EXPECT_THAT(run.output,
-              testing::MatchesRegex("zep: sent to sftp://zep@127.0.0.1:[0-9]+/zep-report-sample-server-[0-9]{8}T[0-9]{6}Z.json.gz: "
-                                    "[0-9]+ bytes, SHA-256 [0-9a-f]{64}\n"));
+  EXPECT_THAT(run.output, testing::MatchesRegex(
+                              "zep: sent to sftp://zep@127.0.0.1:[0-9]+/zep-report-sample-server-[0-9]{8}T[0-9]{6}Z.json.gz: "
+                              "[0-9]+ bytes, SHA-256 [0-9a-f]{64}\n"));
   EXPECT_THAT(ReadFile(dir.Path("printed")), HasSubstr("SAMPLE Identity"));
   std::string const unpacked = RunProgram("gunzip -c " + server.Tree().Path("zep-report-*.json.gz")).output;
   EXPECT_EQ(nlohmann::json::parse(unpacked)["document"], "zep report");
