@@ -289,6 +289,7 @@ TEST_F(RootPathTest, WithoutTheIpmiClientNoControllerAnswers) {
 }
 
 TEST_F(RootPathTest, AnIpmiClientThatComesLaterIsLoadedThen) {
+  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, whose dlopen looks where the program does: beside the real client";
   EXPECT_THAT(Probe("controller '' " ZEP_IPMI_STANDINS "/whole/libipmiClient.so"),
               ElementsAre("[]", "not connected", testing::_, "connected"));
 }
