@@ -53,6 +53,7 @@ std::string WhyNotWritten(TArguments const& arguments, std::string const& file, 
 }
 
 int Get(TArguments const& arguments) {
+  if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the URL comes first, and the file behind it");
   TTarget const source = TargetOf(arguments.fUrl, false);
   if (source.fIsHost) throw TWrongUsage("a URL is needed, ftp:// or sftp://");
   std::string const file = WithoutLinks(arguments.fFile);

@@ -31,6 +31,15 @@ std::string FirstLineOf(std::string const& text) {
   return Printable(text.substr(0, std::min(kLongest, text.find_first_of("\r\n"))));
 }
 
+// The title of a web page, such as that of a proxy's refusal; else its first line.
+std::string AnswerIn(std::string const& page) {
+  if (page.empty()) return "nothing came back";
+  std::string const start = "<title>";
+  std::size_t const title = page.find(start), end = page.find("</title>");
+  if (title == page.npos || end == page.npos || end < title) return "what came back begins with: " + FirstLineOf(page);
+  return "what came back is entitled: " + FirstLineOf(page.substr(title + start.size(), end - title - start.size()));
+}
+
 // Something may come back from the proxy itself: its refusal, or that it cannot reach the page. So the page has to be the one.
 TOutcome Check(TRemote const& proxy, TTransferOptions const& options) {
   TScratchDirectory const scratch("zep-proxy-check");  // the library writes the page into the working directory
@@ -46,8 +55,7 @@ TOutcome Check(TRemote const& proxy, TTransferOptions const& options) {
   std::ostringstream page;
   page << std::ifstream(pageFile).rdbuf();
   if (page.str().find(ZEP_PROXY_CHECK_TEXT) != std::string::npos) return outcome;
-  std::string const answer = page.str().empty() ? "nothing came back" : "what came back begins with: " + FirstLineOf(page.str());
-  return {kZEPStatusAccessDenied, kExitNothing, "the page did not come through; " + answer};
+  return {kZEPStatusAccessDenied, kExitNothing, "the page did not come through; " + AnswerIn(page.str())};
 }
 
 int Tell(std::string const& proxy, TOutcome const& outcome, bool asJson, bool quiet) {

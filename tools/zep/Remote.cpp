@@ -7,9 +7,11 @@
 #include <unistd.h>
 
 #include <cctype>
+#include <cerrno>
 #include <cstdlib>
 #include <fstream>
 #include <string_view>
+#include <system_error>
 
 namespace NQRVZEP20::zep {
 
@@ -182,6 +184,8 @@ std::string ShownUrlOf(TRemote const& remote) {
 
 void FindPassword(TRemote& remote, std::string const& netrcFile) {
   if (!remote.fPassword.empty()) return;
+  if (!netrcFile.empty() && ::access(netrcFile.c_str(), R_OK) != 0)
+    throw TWrongUsage(netrcFile + ": " + std::generic_category().message(errno));
   TLogin const login = LoginOf(remote, netrcFile.empty() ? DefaultNetrc() : netrcFile);
   if (remote.fUser.empty()) remote.fUser = login.fUser;
   remote.fPassword = login.fPassword;

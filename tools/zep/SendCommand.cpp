@@ -1,6 +1,7 @@
 // zep send: a file to an FTP or SFTP server.
 
 #include "Commands.h"
+#include "Failure.h"
 #include "Transfer.h"
 
 #include <CLI/CLI.hpp>
@@ -18,6 +19,7 @@ struct TArguments {
 };
 
 int Send(TArguments const& arguments) {
+  if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the file comes first, and where it goes behind it");
   TTarget const target = TargetOf(arguments.fTarget, arguments.fBySftp);
   TTransferred const sent = SendFile(arguments.fFile, target, arguments.fName, arguments.fOptions);
   return TellOf(sent, "zep send", arguments.fAsJson, arguments.fOptions);

@@ -18,6 +18,7 @@
 #include <cerrno>
 #include <chrono>
 #include <cstdio>
+#include <cstdlib>
 #include <filesystem>
 #include <iostream>
 
@@ -103,6 +104,15 @@ bool IsAsBefore(std::string const& file, struct stat const& before) {
 
 void AddName(TRemote& remote, std::string const& name) {
   if (remote.fPath.empty() || remote.fPath.back() == '/') remote.fPath += EncodedName(name);
+}
+
+// Where the file arrives: on bootable media the library chooses the directory of a host.
+TRemote PlaceOf(TTarget const& target) {
+  char const* const isBootable = std::getenv("ZEP_ISBOOTABLE");
+  TRemote place = target.fRemote;
+  if (target.fIsHost && isBootable && std::string(isBootable) == "yes")
+    place.fPath = "hostline/toqrv/vantor/fdr_upload/" + place.fPath;
+  return place;
 }
 
 TZEPStatusCode Send(std::string const& file, TTarget const& target) {
@@ -243,15 +253,17 @@ void AddTransferOptions(CLI::App& command, TTransferOptions& options) {
 
 std::string TransferHelp() {
   return "Passwords come from the URL (which other users may see in the list of processes), from netrc, or from a prompt.\n"
+         "The key of an SFTP server is not checked: who stands in its place gets the password.\n"
          "In the path of a URL blanks and the like may be written as they are; \"%20\" stays what it is.\n"
          "Exit status: 0 when all went well, 1 when the server refused it or the transfer broke off, 64 for wrong usage,\n"
          "66 when the file to be sent cannot be read, 68 when the host is unknown or nobody answers, 69 without libcurl,\n"
          "73 when the local file exists or cannot be written, 75 when nothing moved for too long.";
 }
 
+bool IsUrl(std::string const& text) { return text.find("://") != text.npos; }
+
 TTarget TargetOf(std::string const& text, bool bySftp) {
-  bool const isUrl = text.find("://") != text.npos;
-  TTarget target{RemoteOf(text, bySftp ? "sftp" : "ftp"), !isUrl};
+  TTarget target{RemoteOf(text, bySftp ? "sftp" : "ftp"), !IsUrl(text)};
   if (target.fRemote.fScheme != "ftp" && target.fRemote.fScheme != "sftp") throw TWrongUsage("only ftp:// and sftp:// are known");
   if (target.fIsHost && !target.fRemote.fPath.empty()) throw TWrongUsage("a host has no path; write a URL");
   return target;
@@ -259,14 +271,14 @@ TTarget TargetOf(std::string const& text, bool bySftp) {
 
 TTransferred SendFile(std::string const& file, TTarget target, std::string const& name, TTransferOptions const& options) {
   AddName(target.fRemote, name.empty() ? fs::path(file).filename().string() : name);
-  TTransferred transferred = TransferOf(target.fRemote, file);
+  TTransferred transferred = TransferOf(PlaceOf(target), file);
   struct stat before;
   std::string const why = WhyNotReadable(file, before);
   if (!why.empty()) return Failed(transferred, kExitNoInput, why);
   transferred.fBytes = static_cast<std::uint64_t>(before.st_size);
 
   FindPassword(target.fRemote, options.fNetrc);
-  transferred.fUrl = ShownUrlOf(target.fRemote);
+  transferred.fUrl = ShownUrlOf(PlaceOf(target));
   transferred.fOutcome = Transfer([&] { return Send(file, target); }, transferred, target.fRemote.fPassword, true, options);
   if (transferred.fOutcome.fExit != kExitComplete) {
     bool const wasReached = transferred.fOutcome.fExit == kExitNothing || transferred.fOutcome.fExit == kExitStalled;

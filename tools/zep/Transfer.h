@@ -41,6 +41,8 @@ struct TTarget {
   bool fIsHost;  // the library chooses the directory then
 };
 
+bool IsUrl(std::string const& text);
+
 // Of ftp and sftp only. Throws TWrongUsage.
 TTarget TargetOf(std::string const& text, bool bySftp);
 

@@ -13,6 +13,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <cctype>
 #include <chrono>
 #include <filesystem>
 #include <fstream>
@@ -103,10 +104,25 @@ std::uint64_t BytesMoved(TWatch const& watch, struct stat const& file, pid_t pro
   return absent ? 0 : size;
 }
 
+bool IsWordAt(std::string const& text, std::size_t at, std::size_t length) {
+  auto const isLetter = [&](std::size_t i) { return i < text.size() && std::isalnum(static_cast<unsigned char>(text[i])) != 0; };
+  return (at == 0 || !isLetter(at - 1)) && !isLetter(at + length);
+}
+
+// A short secret is hidden only where it stands alone: stars within other words would tell it.
 std::string Without(std::string const& secret, std::string text) {
+  constexpr std::size_t kShort = 4;
   if (secret.empty()) return text;
-  for (std::size_t at = 0; (at = text.find(secret, at)) != text.npos; at += 3) text.replace(at, secret.size(), "***");
+  for (std::size_t at = 0; (at = text.find(secret, at)) != text.npos;) {
+    bool const isHidden = secret.size() >= kShort || IsWordAt(text, at, secret.size());
+    if (isHidden) text.replace(at, secret.size(), "***");
+    at += isHidden ? 3 : 1;
+  }
   return text;
+}
+
+bool EndsWith(std::string const& text, std::string const& end) {
+  return text.size() >= end.size() && text.compare(text.size() - end.size(), end.size(), end) == 0;
 }
 
 TOutcome OutcomeOf(std::string const& report, TWatch const& watch) {
@@ -114,7 +130,8 @@ TOutcome OutcomeOf(std::string const& report, TWatch const& watch) {
   if (blank == report.npos) return {kZEPStatusFail, kExitNothing, "the process of the transfer died"};
   TZEPStatusCode const status(static_cast<EZEPStatusCode>(std::stoi(report.substr(0, blank))));
   if (status == kZEPStatusOK) return {status, kExitComplete, ""};
-  std::string const reason = Printable(Without(watch.fSecret, report.substr(blank + 1)));
+  std::string reason = Printable(Without(watch.fSecret, report.substr(blank + 1)));
+  if (EndsWith(reason, ": ")) reason += "libcurl does not tell why";
   return {status, ExitStatusOf(status), reason.empty() ? status.TranslateStatusCode() : reason};
 }
 
