@@ -3,6 +3,8 @@
 #include "TLogger.h"
 #include "TRootObject.h"
 
+#include <sys/stat.h>
+
 #include <cctype>
 #include <filesystem>
 #include <fstream>
@@ -13,8 +15,18 @@
 
 namespace NQRVZEP20 {
 
+namespace {
+
+// Whatever the caller's settings are: other users reach what tests make, tools speak English, loopback needs no proxy.
+[[maybe_unused]] mode_t const gCallersUmask = ::umask(022);
+[[maybe_unused]] bool const gIsPlain =
+    ::setenv("LC_ALL", "C", 1) == 0 && ::unsetenv("no_proxy") == 0 && ::unsetenv("NO_PROXY") == 0;
+
+}  // namespace
+
 TTempDir::TTempDir() {
-  std::string pattern = (std::filesystem::temp_directory_path() / "zep-test.XXXXXX").string();
+  namespace fs = std::filesystem;
+  std::string pattern = (fs::canonical(fs::temp_directory_path()) / "zep-test.XXXXXX").string();
   if (::mkdtemp(pattern.data()) == nullptr) throw std::runtime_error("no temporary directory");
   fPath = pattern;
 }

@@ -77,7 +77,7 @@ ZEP_EXPORT int select(int count, fd_set* readable, fd_set* writable, fd_set* fai
   timeval shortened;
   if (gFastSelect != nullptr && limit != nullptr) {
     gFastSelect->Add(limit->tv_sec);
-    shortened = {limit->tv_sec / 1000, static_cast<suseconds_t>(limit->tv_sec % 1000 * 1000)};
+    shortened = {limit->tv_sec / 100, static_cast<suseconds_t>(limit->tv_sec % 100 * 10000)};
     limit = &shortened;
   }
   return static_cast<int>(::syscall(SYS_select, count, readable, writable, failed, limit));

@@ -278,7 +278,7 @@ TEST_F(StandInTest, OnlyTheSpawningIsLogged) {
 }
 
 TEST_F(StandInTest, AHangingHwinfoIsLeftAloneAfterThreeHundredSecondsOfSilence) {
-  Add("hwinfo", "cat " + PathOfSample("disk.txt") + "; echo $$ > " + dir_.Path("pid") + "; exec sleep 60");
+  Add("hwinfo", "echo $$ > " + dir_.Path("pid") + "; cat " + PathOfSample("disk.txt") + "; exec sleep 60");
   TFastSelect const time;
   TLines devices;
   TLines const log = LogOf([&] { devices = VirtualDevices(0, false); });

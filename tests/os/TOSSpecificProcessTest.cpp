@@ -259,11 +259,11 @@ TEST_F(SpawnProcessTest, AChildEndedByASignalIsLogged) {
 
 TEST_F(SpawnProcessTest, TimeoutIsOneOfSilenceAndLeavesTheChildAlive) {
   TRun run;
-  EXPECT_EQ(LogOf([&] { run = RunChild("StaysSilent", {}, 1); }),
+  EXPECT_EQ(LogOf([&] { run = RunChild("StaysSilent", {}, 3); }),
             (TEntries{"[Debug] SpawnProcess: process " + Child("StaysSilent"),
                       "[Debug] ERROR: SpawnProcess - " + Child("StaysSilent") + " TimeOut!"}));
   EXPECT_EQ(run.result, -1);
-  EXPECT_GE(run.time, 990ms);
+  EXPECT_GE(run.time, 2990ms);
   EXPECT_LT(run.time, 15s);
   EndChild(run.output);  // what came before the silence stays in the output
 }
@@ -271,7 +271,7 @@ TEST_F(SpawnProcessTest, TimeoutIsOneOfSilenceAndLeavesTheChildAlive) {
 TEST_F(SpawnProcessTest, TimeoutOfTheFormWithEnvironmentNamesItsPath) {
   std::string output;
   TEntries const entries =
-      LogOf([&] { EXPECT_EQ(TOSSpecific::SpawnProcess(Child("StaysSilent"), {}, "zero", {}, output, 1), -1); });
+      LogOf([&] { EXPECT_EQ(TOSSpecific::SpawnProcess(Child("StaysSilent"), {}, "zero", {}, output, 3), -1); });
   ASSERT_EQ(entries.size(), 2u);
   EXPECT_EQ(entries[1], "[Debug] ERROR: SpawnProcess - " + Child("StaysSilent") + " TimeOut!");
   EndChild(output);
@@ -279,15 +279,15 @@ TEST_F(SpawnProcessTest, TimeoutOfTheFormWithEnvironmentNamesItsPath) {
 
 TEST_F(SpawnProcessTest, TimeoutOfZeroAllowsNoSilenceAtAll) {
   std::string output;
-  EXPECT_EQ(RunChild("TalksSlowly", {"300", "1"}, 0).result, -1);
+  EXPECT_EQ(RunChild("TalksSlowly", {"3000", "1"}, 0).result, -1);
   EXPECT_GT(::wait(nullptr), 0);
 }
 
 TEST_F(SpawnProcessTest, AChildThatKeepsTalkingIsNeverTimedOut) {
-  TRun const run = RunChild("TalksSlowly", {"700", "4"}, 2);
+  TRun const run = RunChild("TalksSlowly", {"1300", "5"}, 5);
   EXPECT_EQ(run.result, 0);
-  EXPECT_EQ(run.output, "....");
-  EXPECT_GE(run.time, 2700ms);
+  EXPECT_EQ(run.output, ".....");
+  EXPECT_GE(run.time, 6400ms);
 }
 
 TEST_F(SpawnProcessTest, TimeoutOfMinusOneWaitsForEver) {
@@ -415,7 +415,7 @@ TEST_F(SpawnProcessTest, ChildInheritsTheCallersDescriptorsAndNotItsPipe) {
 TEST_F(SpawnProcessTest, PipeOfAnotherThreadIsInherited) {
   std::string const before = InheritableDescriptors();
   int const count = OpenDescriptors();
-  std::thread other([] { RunChild("TalksSlowly", {"1500", "1"}); });
+  std::thread other([] { RunChild("TalksSlowly", {"4000", "1"}); });
   while (OpenDescriptors() != count + 1) std::this_thread::sleep_for(5ms);  // the read end of its pipe
   std::string const during = InheritableDescriptors(), descriptors = RunChild("PrintsDescriptors").output;
   other.join();
@@ -488,7 +488,7 @@ TEST_F(SpawnProcessTest, LeavesNoDescriptorOpen) {
   TOSSpecific::SpawnProcess("/nonexistent", kForEver);
   EXPECT_EQ(OpenDescriptors(), before);
   std::string output;
-  TOSSpecific::SpawnProcess(Child("StaysSilent"), {}, output, 1);
+  TOSSpecific::SpawnProcess(Child("StaysSilent"), {}, output, 3);
   EXPECT_EQ(OpenDescriptors(), before);
   EndChild(output);
 }

@@ -6,7 +6,7 @@
 set -euo pipefail
 build=$1 cxx=$2
 here=$(cd "$(dirname "$0")" && pwd)
-work=$(mktemp -d)
+work=$(realpath "$(mktemp -d)")
 trap 'rm -rf "$work"' EXIT
 cmake --install "$build" --prefix "$work/prefix" >"$work/install.log"
 

@@ -89,19 +89,19 @@ TEST_F(IpmiClientTest, EachReasonNotToOpenHasItsCode) {
   };
   std::string const tooLong(21, 'x');
   TRow const rows[] = {
-      {"wrong password", "127.0.0.1", "623", "zepadmin", "wrong", kIpmiClientWrongPassword, 1},
-      {"empty password", "127.0.0.1", "623", "zepadmin", "", kIpmiClientWrongPassword, 1},
-      {"unknown user", "127.0.0.1", "623", "nobody", "zeppass1", kIpmiClientUnknownUser, 1},
-      {"disabled user", "127.0.0.1", "623", "zepoff", "offpass", kIpmiClientUnknownUser, 1},
-      {"nobody listens", "127.0.0.1", "624", "zepadmin", "zeppass1", kIpmiClientNoAnswer, 6.5},
-      {"no route", "192.0.2.1", "623", "zepadmin", "zeppass1", kIpmiClientUnreachable, 1},
-      {"no such host", "no such host", "623", "zepadmin", "zeppass1", kIpmiClientHostUnknown, 6.5},
-      {"no host", "", "623", "zepadmin", "zeppass1", kIpmiClientHostUnknown, 1},
-      {"a password that is too long", "127.0.0.1", "623", "zepadmin", tooLong.c_str(), kIpmiClientBadArgument, 1},
-      {"null host", nullptr, "623", "zepadmin", "zeppass1", kIpmiClientBadArgument, 1},
-      {"null port", "127.0.0.1", nullptr, "zepadmin", "zeppass1", kIpmiClientBadArgument, 1},
-      {"null user", "127.0.0.1", "623", nullptr, "zeppass1", kIpmiClientBadArgument, 1},
-      {"null password", "127.0.0.1", "623", "zepadmin", nullptr, kIpmiClientBadArgument, 1},
+      {"wrong password", "127.0.0.1", "623", "zepadmin", "wrong", kIpmiClientWrongPassword, 3.5},
+      {"empty password", "127.0.0.1", "623", "zepadmin", "", kIpmiClientWrongPassword, 3.5},
+      {"unknown user", "127.0.0.1", "623", "nobody", "zeppass1", kIpmiClientUnknownUser, 3.5},
+      {"disabled user", "127.0.0.1", "623", "zepoff", "offpass", kIpmiClientUnknownUser, 3.5},
+      {"nobody listens", "127.0.0.1", "624", "zepadmin", "zeppass1", kIpmiClientNoAnswer, 8.5},
+      {"no route", "192.0.2.1", "623", "zepadmin", "zeppass1", kIpmiClientUnreachable, 3.5},
+      {"no such host", "no such host", "623", "zepadmin", "zeppass1", kIpmiClientHostUnknown, 8.5},
+      {"no host", "", "623", "zepadmin", "zeppass1", kIpmiClientHostUnknown, 3.5},
+      {"a password that is too long", "127.0.0.1", "623", "zepadmin", tooLong.c_str(), kIpmiClientBadArgument, 3.5},
+      {"null host", nullptr, "623", "zepadmin", "zeppass1", kIpmiClientBadArgument, 3.5},
+      {"null port", "127.0.0.1", nullptr, "zepadmin", "zeppass1", kIpmiClientBadArgument, 3.5},
+      {"null user", "127.0.0.1", "623", nullptr, "zeppass1", kIpmiClientBadArgument, 3.5},
+      {"null password", "127.0.0.1", "623", "zepadmin", nullptr, kIpmiClientBadArgument, 3.5},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);
@@ -125,7 +125,7 @@ TEST_F(IpmiClientTest, ASilentControllerIsGivenUpAfterAbout5Seconds) {
   auto const start = TClock::now();
   EXPECT_EQ(client_.Open(623), kIpmiClientNoAnswer);
   EXPECT_GT(SecondsSince(start), 3);
-  EXPECT_LT(SecondsSince(start), 6.5);
+  EXPECT_LT(SecondsSince(start), 8.5);
   EXPECT_GT(silent.Received(), 1) << "it should have been asked more than once";
 }
 

@@ -6,6 +6,7 @@
 #include "tests/os/Programs.h"
 
 #include <fcntl.h>
+#include <sys/file.h>
 
 #include <cstdlib>
 #include <stdexcept>
@@ -51,9 +52,17 @@ private:
   std::string fPath;
 };
 
+// Loop devices belong to the whole machine: other tests of this kind, also those of another build tree, wait until this
+// process has ended.
+inline bool HasLoopDevicesForItself() {
+  static int const lock = ::open("/dev/loop-control", O_RDONLY | O_CLOEXEC);
+  return lock >= 0 && ::flock(lock, LOCK_EX) == 0;
+}
+
 // Whether images can be mounted here.
 inline bool MayMountImages() {
-  return MayMount() && RunProgram("/usr/sbin/losetup --find >/dev/null 2>&1 && test -x /usr/sbin/mke2fs").exitCode == 0;
+  return MayMount() && HasLoopDevicesForItself() &&
+         RunProgram("/usr/sbin/losetup --find >/dev/null 2>&1 && test -x /usr/sbin/mke2fs").exitCode == 0;
 }
 
 #define NEEDS_IMAGES() NEEDS(MayMountImages(), "mounting images needs root, loop devices and e2fsprogs")

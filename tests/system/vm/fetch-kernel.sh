@@ -28,9 +28,10 @@ package() { apt-cache depends "$meta" 2>/dev/null | sed -n 's/^ *Depends: \(linu
 pkg=$(package)
 [ -n "$pkg" ] || [ "$(id -u)" != 0 ] || { apt-get -qq update && pkg=$(package); }
 [ -n "$pkg" ] || { echo "$0: $meta is unknown; run apt-get update first" >&2; exit 1; }
-rm -rf "$dest"
-mkdir -p "$dest"
-cd "$dest"
+mkdir -p "$(dirname "$dest")"
+[ ! -e "$dest" ] || rm -rf "$dest"  # without its mark it is not whole
+new=$(mktemp -d "$dest.XXXXXX")  # others may fetch it at the same time
+cd "$new"
 apt-get -qq -o APT::Sandbox::User=root download "$pkg"
 dpkg-deb -x "$pkg"_*.deb .
 rm -f "$pkg"_*.deb
@@ -39,4 +40,8 @@ PATH=$PATH:/usr/sbin:/sbin depmod -b . "$release"
 ln -s "boot/vmlinuz-$release" vmlinuz
 echo "$release" > release
 : > ok
+if ! mv -T "$new" "$dest" 2>/dev/null; then
+  [ -e "$dest/ok" ] || { echo "$0: $dest is in the way" >&2; exit 1; }
+  rm -rf "$new"
+fi
 echo "$dest"

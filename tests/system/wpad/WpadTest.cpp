@@ -146,8 +146,8 @@ TEST_F(WpadTest, NoAnswerTakesThreeTimesSixSeconds) {
   TDiscovery const found = Discover("WPAD_SERVER=none");
   EXPECT_EQ(found.url, "");
   EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice({"[Debug] receiving  DHCP message error!"}) + kShows);
-  EXPECT_GE(found.milliseconds, 18000);
-  EXPECT_LE(found.milliseconds, 20000);
+  EXPECT_GE(found.milliseconds, 17900);
+  EXPECT_LE(found.milliseconds, 23500);  // the kernel rounds each wait up; a fourth would make it 24 s
 }
 
 TEST_F(WpadTest, WithoutARouteNothingIsSent) {
@@ -271,7 +271,7 @@ TEST_F(WpadTest, DhcpClientsAreEnded) {
     mkdir /dev/shm/bin; for name in xdhclient6 dhclien; do cp "$(command -v sleep)" /dev/shm/bin/$name; /dev/shm/bin/$name 99 & done
     names() { ps -e -o comm= | grep -E 'dhclien' | sort | xargs; }
     until [ "$(names | wc -w)" = 3 ]; do sleep 0.02; done
-    names; $PROBE stop; sleep 0.3; names; ls /dev/nul)sh"));
+    names; $PROBE stop; for _ in $(seq 100); do [ "$(names)" = dhclien ] && break; sleep 0.1; done; names; ls /dev/nul)sh"));
   EXPECT_EQ(lines.size(), 6u);
   EXPECT_EQ(lines[0], "dhclien dhclient xdhclient6");
   EXPECT_EQ(TLines(lines.begin() + 3, lines.end()), (kStops + TLines{"dhclien", "/dev/nul"}));

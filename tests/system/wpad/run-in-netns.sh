@@ -66,7 +66,7 @@ ip -n "$c" addr add "${WPAD_ADDRESS:-10.77.0.2}/16" broadcast 10.77.255.255 dev 
 ip -n "$c" addr add fd77::2/64 dev "$name" nodad
 for n in "$s" "$c"; do ip -n "$n" link set lo up; done
 ip -n "$s" link set srv0 up; ip -n "$c" link set "$name" up
-for _ in $(seq 100); do   # carrier comes a moment after "up"; other namespaces that come and go are complained of
+for _ in $(seq 400); do   # carrier comes a moment after "up"; other namespaces that come and go are complained of
   ip -n "$c" -o link show "$name" 2>/dev/null | grep -q 'state UP' && break
   sleep 0.02
 done
@@ -99,7 +99,7 @@ case $kind in
     dhcp=$!; ready='listening' ;;
 esac
 if [ -n "$dhcp" ]; then
-  for _ in $(seq 100); do
+  for _ in $(seq 400); do
     grep -q "$ready" "$log" && break
     kill -0 "$dhcp" 2>/dev/null || { cat "$log" >&2; fail "the DHCP server did not start"; }
     sleep 0.05
@@ -109,7 +109,8 @@ fi
 mkdir "$tmp/www" "$tmp/bin" "$tmp/dev"
 echo 'function FindProxyForURL(url, host) { return "PROXY 10.77.0.1:3128"; }' > "$tmp/www/wpad.dat"
 ip netns exec "$s" python3 -m http.server --bind 10.77.0.1 --directory "$tmp/www" 80 > "$tmp/web.log" 2>&1 & web=$!
-for _ in $(seq 100); do [ -n "$(ip netns exec "$s" ss -Hlnt 'sport = :80')" ] && break; sleep 0.05; done
+for _ in $(seq 400); do [ -n "$(ip netns exec "$s" ss -Hlnt 'sport = :80')" ] && break; sleep 0.05; done
+[ -n "$(ip netns exec "$s" ss -Hlnt 'sport = :80')" ] || fail "no web server"
 
 printf '127.0.0.1 localhost\n10.77.0.1 wpad.test wpad\n' > "$tmp/hosts"
 printf 'nameserver 10.77.0.1\noptions timeout:1 attempts:1\n' > "$tmp/resolv.conf"

@@ -197,6 +197,7 @@ TEST_F(ReportTest, ATableFileOfAnotherUserSaysWhy) {
   call.asNobody = true;
   TRun const run = zep_.Run(call);
   EXPECT_EQ(run.status, 2);
+  ASSERT_FALSE(run.output.empty());
   EXPECT_EQ(LinesOf(run.output)[0], "db1: not identified: the SMBIOS table file " + table + " may not be read by this user");
 }
 

@@ -33,7 +33,7 @@ TEST_F(RunTest, OptionsBehindTheCommandAreTheCommands) {
 }
 
 TEST_F(RunTest, AZeroByteCutsOffTheRestOfItsChunk) {
-  EXPECT_EQ(Run({"sh", "-c", "printf 'seen\\0lost'; sleep 0.2; echo +"}).output, "seen+\n");
+  EXPECT_EQ(Run({"sh", "-c", "printf 'seen\\0lost'; sleep 1; echo +"}).output, "seen+\n");
 }
 
 TEST_F(RunTest, ATimeoutOfZeroAllowsNoSilence) {
@@ -74,13 +74,14 @@ TEST_F(RunTest, TellsThatACommandFailed) {
 }
 
 TEST_F(RunTest, TheTimeoutIsOneOfSilence) {
-  EXPECT_EQ(Run({"--timeout", "2", "sh", "-c", "sleep 1; echo a; sleep 1; echo b; sleep 1"}).output, "a\nb\n");
+  EXPECT_EQ(Run({"--timeout", "3", "sh", "-c", "sleep 1; echo a; sleep 1; echo b; sleep 1; echo c; sleep 1"}).output,
+            "a\nb\nc\n");
   auto const start = std::chrono::steady_clock::now();
-  TRun const run = Run({"--timeout", "1", "sh", "-c", "echo $$; exec sleep 30"});
+  TRun const run = Run({"--timeout", "3", "sh", "-c", "echo $$; exec sleep 30"});
   EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(20));
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors,
-            "zep: sh could not be executed, did not exit with 0 or was ended by a signal, or was silent for more than 1 s and is "
+            "zep: sh could not be executed, did not exit with 0 or was ended by a signal, or was silent for more than 3 s and is "
             "left running\n");
   EXPECT_EQ(::kill(std::stoi(run.output), SIGKILL), 0) << "the command should still run";
 }

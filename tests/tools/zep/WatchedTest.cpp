@@ -122,12 +122,18 @@ TEST(RunWatchedTest, AFileThatIsSentMayLoseItsName) {
     TWatch watch;
     watch.fFile = dir.Path("f");
     watch.fIsUpload = true;
-    watch.fStallSeconds = 1;
-    watch.fShowProgress = [&seen](std::uint64_t bytes) { seen = bytes; };
+    watch.fStallSeconds = 2;
+    int looked[2];
+    ASSERT_EQ(::pipe(looked), 0);
+    watch.fShowProgress = [&](std::uint64_t bytes) {
+      seen = bytes;
+      EXPECT_EQ(::write(looked[1], "", 1), 1);
+    };
     TOutcome const outcome = RunWatched(
         [&] {
           int const file = ::open(watch.fFile.c_str(), O_RDONLY);
-          ::usleep(300000);  // until zep has looked at it
+          char byte;
+          if (::read(looked[0], &byte, 1) != 1) return kZEPStatusFail;  // zep has looked at it
           if (std::rename(watch.fFile.c_str(), dir.Path("g").c_str()) != 0) return kZEPStatusFail;
           if (isDeleted) ::unlink(dir.Path("g").c_str());
           char bytes[100];
@@ -136,6 +142,8 @@ TEST(RunWatchedTest, AFileThatIsSentMayLoseItsName) {
           return kZEPStatusOK;
         },
         watch);
+    ::close(looked[0]);
+    ::close(looked[1]);
     EXPECT_EQ(outcome.fExit, kExitComplete) << outcome.fReason;
     EXPECT_EQ(seen, 600u);
   }

@@ -12,6 +12,7 @@
 
 #include <csignal>
 #include <map>
+#include <regex>
 
 namespace NQRVZEP20::zep {
 
@@ -33,6 +34,11 @@ struct TCall {
   std::string directory = {};       // to work in
   bool hasNoTerminal = false;       // in a session of its own
 };
+
+// How long something took differs: "after 0.1 s" becomes "after N s".
+inline std::string WithoutSeconds(std::string const& text) {
+  return std::regex_replace(text, std::regex("after [0-9]+\\.[0-9] s"), "after N s");
+}
 
 class TInstallation {
 public:
@@ -64,7 +70,8 @@ public:
     if (child == 0) Exec(call);
     int status = 0;
     ::waitpid(child, &status, 0);
-    return {WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status), ReadFile(Path("out")), ReadFile(Path("err"))};
+    return {WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status), WithoutSeconds(ReadFile(Path("out"))),
+            WithoutSeconds(ReadFile(Path("err")))};
   }
 
 private:

@@ -26,7 +26,7 @@
 
 namespace {
 
-constexpr long kHurry = 20;
+constexpr long kHurry = 8;
 
 bool IsInHurry() { return ::getenv("ZEP_WPAD_HURRY") != nullptr; }
 
