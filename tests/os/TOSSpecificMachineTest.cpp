@@ -1,5 +1,6 @@
 #include "TOSSpecific.h"
 
+#include "tests/LogOf.h"
 #include "tests/SmbiosTables.h"
 
 #include <gmock/gmock.h>
@@ -21,17 +22,6 @@ protected:
     ::setenv("ZEP_SMBIOS_TABLE", dir_.Path("table").c_str(), 1);
   }
   void UseNoTable() { ::setenv("ZEP_SMBIOS_TABLE", dir_.Path("absent").c_str(), 1); }
-
-  template <class TOperation>
-  std::vector<std::string> LogOf(TOperation operation) {
-    std::vector<std::string> entries;
-    OnNewThread([&] {
-      TLogCapture const log;
-      operation();
-      entries = log.Entries();
-    });
-    return entries;
-  }
 
   TTempDir dir_;
   TEnvironmentGuard const variable_{"ZEP_SMBIOS_TABLE", nullptr};  // puts it back

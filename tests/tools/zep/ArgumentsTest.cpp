@@ -16,6 +16,14 @@ protected:
     return zep_.Run(call);
   }
 
+  void ExpectWrongUsage(std::vector<std::string> const& arguments, std::string const& why) {
+    SCOPED_TRACE(testing::PrintToString(arguments));
+    TRun const run = Run(arguments);
+    EXPECT_EQ(run.status, 64);
+    EXPECT_EQ(run.output, "");
+    EXPECT_EQ(run.errors, "zep: " + why + "\n");
+  }
+
   TInstallation zep_;
 };
 
@@ -50,13 +58,7 @@ TEST_F(ArgumentsTest, WhatIsWrongIsSaidWithoutTheWordsOfTheCommandLine) {
       {{"media", "SECRET1"}, "there is no such command"},
       {{"media", "mount", "/dev/sdz", "SECRET1"}, "there is one argument too many"},
   };
-  for (TRow const& row : rows) {
-    SCOPED_TRACE(testing::PrintToString(row.arguments));
-    TRun const run = Run(row.arguments);
-    EXPECT_EQ(run.status, 64);
-    EXPECT_EQ(run.output, "");
-    EXPECT_EQ(run.errors, "zep: " + row.errors + "\n");
-  }
+  for (TRow const& row : rows) ExpectWrongUsage(row.arguments, row.errors);
 }
 
 TEST_F(ArgumentsTest, ACommandThatThereIsNotIsNamed) {
@@ -113,13 +115,7 @@ TEST_F(ArgumentsTest, WhatIsGivenIsNotEmpty) {
       {{"get", "ftp://h/f", ""}, "file"},
       {{"proxy-check", ""}, "proxy"},
   };
-  for (TRow const& row : rows) {
-    SCOPED_TRACE(testing::PrintToString(row.arguments));
-    TRun const run = Run(row.arguments);
-    EXPECT_EQ(run.status, 64);
-    EXPECT_EQ(run.output, "");
-    EXPECT_EQ(run.errors, "zep: " + row.name + " is given but empty\n");
-  }
+  for (TRow const& row : rows) ExpectWrongUsage(row.arguments, row.name + " is given but empty");
 }
 
 TEST_F(ArgumentsTest, HelpThatCannotBeWrittenIsAFailure) {
