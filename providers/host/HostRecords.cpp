@@ -1,5 +1,6 @@
 #include "HostRecords.h"
 
+#include "Placeholder.h"
 #include "TCIMSchemaHelper.h"
 
 #include <sys/utsname.h>
@@ -19,13 +20,13 @@ TText KernelText(char const* text) { return std::string(text); }
 TSystemName SystemNameOf(utsname const& kernel) {
   char const* named = std::getenv("ZEP_HOST_NAME");
   if (named != nullptr && *named != '\0') return {named, "ZEP_HOST_NAME"};
-  return {kernel.nodename, "uname"};
+  return {HostNameOf(kernel.nodename), "uname"};
 }
 
 TRecord OperatingSystemRecord(TOsRelease const& release, utsname const& kernel, TSystemName const& name) {
   TRecord record(TCIMSchemaHelper::kOperatingSystemCreationClassName, release.GetFile());
   record.AddKey("CSCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
-  record.AddKey("CSName", name.fName);
+  record.AddKey("CSName", name);
   record.AddKey("CreationClassName", TCIMSchemaHelper::kOperatingSystemCreationClassName);
   record.AddKey("Name", release.Value({"NAME"}));
   record.Add("Caption", release.Value({"PRETTY_NAME"}));

@@ -28,6 +28,7 @@ constexpr std::string_view kPlaceholders[] = {
     "unspecified",
     "invalid",
     "none",
+    "(none)",
     "null",
     "n/a",
     "na",
@@ -106,6 +107,13 @@ bool IsRowOfFillers(std::string_view text) {
 bool IsPlaceholder(std::string_view text) {
   std::string const lower = Lower(WithoutOuterBlanks(text));
   return IsOneOf(kPlaceholders, lower) || IsNumberedPlaceholder(lower) || IsRowOfFillers(lower);
+}
+
+TFinding<std::string> HostNameOf(std::string const& nodeName) {
+  if (nodeName.empty()) return TMissing{kMissingNotGiven, "the kernel gives an empty host name"};
+  if (nodeName == "(none)")
+    return TMissing{kMissingPlaceholder, "placeholder text of the kernel: \"(none)\"; no host name is set"};
+  return nodeName;
 }
 
 TFinding<std::string> WithoutPlaceholder(TFinding<std::string> const& text) {

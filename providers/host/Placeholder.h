@@ -11,6 +11,10 @@ namespace NQRVZEP20 {
 // "0123456789", a row of one filler character, and the like. Case and surrounding blanks do not matter.
 bool IsPlaceholder(std::string_view text);
 
+// The machine's own name, as `uname` gives it. Missing where it is "(none)", which the kernel gives until a name is set. The
+// firmware's placeholders are not looked for: a machine may well be called "default".
+TFinding<std::string> HostNameOf(std::string const& nodeName);
+
 // The same finding, but missing where its text is a placeholder or blank.
 TFinding<std::string> WithoutPlaceholder(TFinding<std::string> const& text);
 

@@ -87,7 +87,7 @@ TRecord MakeRecord(TSystemName const& name, TText const& id, TText const& type, 
                    TText const& revision) {
   TRecord record(kClassName, "sysfs");
   record.AddKey("SystemCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
-  record.AddKey("SystemName", name.fName);
+  record.AddKey("SystemName", name);
   record.AddKey("CreationClassName", kClassName);
   record.AddKey("DeviceID", id);
   record.Add("DeviceType", type);

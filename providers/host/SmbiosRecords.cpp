@@ -297,7 +297,7 @@ TFinding<std::uint32_t> SpeedOf(TSmbiosStructure const& memoryDevice, std::size_
 TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name) {
   TRecord record(TCIMSchemaHelper::kSystemCreationClassName, name.fSource);
   record.AddKey("CreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
-  record.AddKey("Name", TFinding<std::string>(name.fName));
+  record.AddKey("Name", name.fName);
   record.SetSource(source);
   record.Add("Manufacturer", TextOf(system, 0x04));
   record.Add("ProductName", TextOf(system, 0x05));
@@ -344,7 +344,7 @@ TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source
 TRecord ProcessorRecord(TSmbiosStructure const& processor, std::string const& source, unsigned number, TSystemName const& name) {
   TRecord record("CIM_Processor", source);
   record.AddKey("SystemCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
-  record.AddKey("SystemName", name.fName);
+  record.AddKey("SystemName", name);
   record.AddKey("CreationClassName", "CIM_Processor");
   record.AddKey("DeviceID", "Processor " + std::to_string(number));
   record.Add("Name", TextOf(processor, 0x04));

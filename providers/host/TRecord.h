@@ -19,7 +19,10 @@ struct TRecordProperty {
 
 // The name that the machine goes by, and where it comes from.
 struct TSystemName {
-  std::string fName;
+  TSystemName(std::string name, std::string source) : fName(std::move(name)), fSource(std::move(source)) {}
+  TSystemName(TFinding<std::string> name, std::string source) : fName(std::move(name)), fSource(std::move(source)) {}
+
+  TFinding<std::string> fName;
   std::string fSource;
 };
 
@@ -40,6 +43,12 @@ public:
   void AddKey(std::string name, TFinding<T> const& finding) {
     Add(std::move(name), finding);
     fProperties.back().fIsKey = true;
+  }
+
+  // A key property that repeats the name of the system that the piece belongs to.
+  void AddKey(std::string name, TSystemName const& system) {
+    AddKey(std::move(name), system.fName);
+    fProperties.back().fSource.clear();
   }
 
   template <class T>

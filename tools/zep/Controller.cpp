@@ -7,6 +7,7 @@
 
 #include <chrono>
 #include <cstdio>
+#include <vector>
 
 namespace NQRVZEP20::zep {
 
@@ -16,13 +17,38 @@ using TClock = std::chrono::steady_clock;
 
 constexpr char kEnd = '\0';  // of each field in what a process says
 
-// The text up to its first zero byte, without blanks at its end.
-std::string Field(std::string const& text) {
-  std::string const field = text.substr(0, text.find('\0'));
-  return field.substr(0, field.find_last_not_of(' ') + 1);
-}
+// One part of the identity, as the controller's FRU data hold it.
+class TField {
+public:
+  // The text counts up to its first zero byte.
+  TField(char const* name, std::string const& text) : fName(name), fText(text.substr(0, text.find('\0'))) {}
 
-bool IsTold(std::string const& field) { return !field.empty() && field != "N/A"; }
+  std::string GetName() const { return fName; }
+
+  // Memory that was never written holds 0xFF everywhere.
+  bool IsNotProgrammed() const { return !fText.empty() && fText.find_first_not_of('\xff') == std::string::npos; }
+  bool IsTold() const { return !GetValue().empty() && fText != "N/A"; }
+
+  // Without the blanks and the unwritten memory at its end.
+  std::string GetValue() const { return fText.substr(0, fText.find_last_not_of(" \xff") + 1); }
+
+private:
+  char const* fName;
+  std::string fText;
+};
+
+// Why not all of the fields are told; empty when all are.
+std::string WhyNotAll(std::vector<TField> const& fields) {
+  std::string notProgrammed;
+  bool isOtherMissing = false;
+  for (TField const& field : fields) {
+    if (field.IsNotProgrammed()) notProgrammed += (notProgrammed.empty() ? "" : ", ") + field.GetName();
+    isOtherMissing = isOtherMissing || (!field.IsTold() && !field.IsNotProgrammed());
+  }
+  if (notProgrammed.empty()) return isOtherMissing ? "the controller did not tell everything" : "";
+  return "not programmed in the controller's FRU data (0xFF): " + notProgrammed +
+         (isOtherMissing ? "; the controller did not tell the rest" : "");
+}
 
 std::string WithoutASession(TClock::time_point start, std::string const& why) {
   char seconds[32];
@@ -47,17 +73,16 @@ std::string AskController(std::string const& host, TAccount const& account) {
   if (!why.empty()) return WithoutASession(start, why);
   std::string const answer = TOSSpecific::GetRemoteMT(host, account.fUser, account.fPassword);
   if (answer.empty()) return WithoutASession(start, "it gave one, but not a second time");
-  std::string const type = Field(answer);
-  std::string const model = Field(TOSSpecific::GetRemoteMachineModel(host, account.fUser, account.fPassword));
-  std::string const serialNumber = Field(TOSSpecific::GetRemoteMSN(host, account.fUser, account.fPassword));
+  std::vector<TField> const fields = {
+      {"machine type", answer},
+      {"model", TOSSpecific::GetRemoteMachineModel(host, account.fUser, account.fPassword)},
+      {"serial number", TOSSpecific::GetRemoteMSN(host, account.fUser, account.fPassword)},
+  };
   IIPMILan::GetInstance()->IpmilanCloseConnect();
 
-  std::string said, error;
-  for (std::string const& field : {type, model, serialNumber}) {
-    said += (IsTold(field) ? field : "") + kEnd;
-    if (!IsTold(field)) error = "the controller did not tell everything";
-  }
-  return said + error + kEnd;
+  std::string said;
+  for (TField const& field : fields) said += (field.IsTold() ? field.GetValue() : "") + kEnd;
+  return said + WhyNotAll(fields) + kEnd;
 }
 
 TRemoteIdentity IdentityFrom(std::string const& host, std::string const& said, bool isComplete) {

@@ -18,9 +18,12 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <sched.h>
+#include <unistd.h>
 #include <boost/make_shared.hpp>
 
 #include <functional>
+#include <thread>
 
 namespace NQRVZEP20 {
 namespace {
@@ -241,6 +244,27 @@ TEST_F(HostNamespaceTest, AMangledTableFillsANamespaceAllTheSame) {
     Fill(table.substr(0, length));
     EXPECT_EQ(InstancesOf("QRVSG_ComputerSystem").size(), 1u) << length;
   }
+}
+
+TEST_F(HostNamespaceTest, AHostNameThatNobodySetIsMissingEverywhere) {
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", SamplePath().c_str());
+  TEnvironmentGuard const name("ZEP_HOST_NAME", nullptr);
+  TEnvironmentGuard const scsi("ZEP_SCSI_DEVICES", scsiDevices_.c_str());
+  ns_ = boost::make_shared<TMemoryNamespace>("root/test");
+  bool isNamedSo = false;
+  std::thread([&] {  // the name is that of this thread alone
+    isNamedSo = ::unshare(CLONE_NEWUTS) == 0 && ::sethostname("(none)", 6) == 0;
+    if (isNamedSo) FillHostNamespace(*ns_);
+  })
+      .join();
+  NEEDS(isNamedSo, "only root may change the host name");
+
+  std::string const reason = "placeholder text of the kernel: \"(none)\"; no host name is set";
+  EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "Name"), "NULL");
+  EXPECT_THAT(MissingOf("QRVSG_ComputerSystem."), ElementsAre("Name: " + reason));
+  EXPECT_EQ(TextOfOnly("QRVSG_OperatingSystem", "CSName"), "NULL");
+  EXPECT_THAT(MissingOf("QRVSG_OperatingSystem."), testing::Contains("CSName: " + reason));
+  EXPECT_EQ(TextOf(*InstancesOf("CIM_Processor")[1], "SystemName"), "NULL");
 }
 
 // ---- SCSI devices ----

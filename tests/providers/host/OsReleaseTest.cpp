@@ -127,13 +127,14 @@ TEST(OsReleaseTest, ARollingSystemHasNoVersionButItsBuild) {
 
 TEST(OsReleaseTest, TheEnvironmentMayNameTheMachine) {
   TEnvironmentGuard const unset("ZEP_HOST_NAME", nullptr);
-  EXPECT_EQ(SystemNameOf(KernelOf("db1")).fName, "db1");
+  EXPECT_EQ(*SystemNameOf(KernelOf("db1")).fName, "db1");
   EXPECT_EQ(SystemNameOf(KernelOf("db1")).fSource, "uname");
   TEnvironmentGuard const empty("ZEP_HOST_NAME", "");
-  EXPECT_EQ(SystemNameOf(KernelOf("db1")).fName, "db1");
+  EXPECT_EQ(*SystemNameOf(KernelOf("db1")).fName, "db1");
   TEnvironmentGuard const named("ZEP_HOST_NAME", "other");
-  EXPECT_EQ(SystemNameOf(KernelOf("db1")).fName, "other");
+  EXPECT_EQ(*SystemNameOf(KernelOf("db1")).fName, "other");
   EXPECT_EQ(SystemNameOf(KernelOf("db1")).fSource, "ZEP_HOST_NAME");
+  EXPECT_EQ(*SystemNameOf(KernelOf("(none)")).fName, "other") << "instead of a placeholder";
 }
 
 TEST(OsReleaseTest, TheCollectorTellsItsVersionAndBuild) {

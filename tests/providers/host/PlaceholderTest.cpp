@@ -13,6 +13,7 @@ TEST(PlaceholderTest, TextsThatStandForNoneAreKnown) {
                            "Not Applicable",
                            "N/A",
                            "None",
+                           "(none)",
                            "System Serial Number",
                            "System Product Name",
                            "System manufacturer",
@@ -78,6 +79,19 @@ TEST(PlaceholderTest, AFindingLosesItsPlaceholderAndTellsIt) {
     ASSERT_FALSE(missing);
     EXPECT_EQ(missing.Why().fCode, "not-given");
     EXPECT_EQ(missing.Why().fReason, "the firmware gives a blank text");
+  }
+}
+
+TEST(PlaceholderTest, TheKernelsNameForNoNameIsNoHostName) {
+  auto const placeholder = HostNameOf("(none)");
+  ASSERT_FALSE(placeholder);
+  EXPECT_EQ(placeholder.Why().fCode, "placeholder");
+  EXPECT_EQ(placeholder.Why().fReason, "placeholder text of the kernel: \"(none)\"; no host name is set");
+  ASSERT_FALSE(HostNameOf(""));
+  EXPECT_EQ(HostNameOf("").Why().fCode, "not-given");
+  for (char const* name : {"db1", "none", "default", "unknown", "xxxx", "localhost"}) {
+    ASSERT_TRUE(HostNameOf(name)) << name;
+    EXPECT_EQ(*HostNameOf(name), name);
   }
 }
 

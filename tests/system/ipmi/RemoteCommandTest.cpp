@@ -143,6 +143,38 @@ TEST_F(ZepRemoteTest, WhatIsMissingIsTold) {
   EXPECT_EQ(zep::JsonOf(run)["error"], "the controller did not tell everything");
 }
 
+TEST_F(ZepRemoteTest, FruDataThatNobodyProgrammedAreToldAsSuch) {
+  struct TRow {
+    std::size_t erasedFrom, erasedTo;
+    char const *type, *model, *serialNumber;  // null: none
+    int status;
+    char const* error;
+  } const rows[] = {
+      {0x1AC, 0x200, nullptr, nullptr, nullptr, 1,
+       "not programmed in the controller's FRU data (0xFF): machine type, model, serial number"},
+      {0x1C0, 0x200, "1234", "AB7", nullptr, 2, "not programmed in the controller's FRU data (0xFF): serial number"},
+      {0x1B3, 0x1CC, "1234", "AB7", "KQ12345", 0, nullptr},  // right behind the model
+      {0x1B0, 0x1CC, "1234", nullptr, "KQ12345", 2, "not programmed in the controller's FRU data (0xFF): model"},
+  };
+  auto const orNull = [](char const* text) { return text != nullptr ? nlohmann::json(text) : nlohmann::json(nullptr); };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.erasedFrom);
+    TSimulator::TSettings settings;
+    settings.fru = FruOf(0x200);
+    std::string image = ReadFile(settings.fru).replace(0x1CC, 8, "KQ12345\0"s);
+    WriteFile(settings.fru, image.replace(row.erasedFrom, row.erasedTo - row.erasedFrom, row.erasedTo - row.erasedFrom, '\xFF'));
+    TSimulator simulator(settings);
+    simulator.WaitUntilReady();
+    zep::TRun const run = Run({"127.0.0.1", "--json"});
+    EXPECT_EQ(run.status, row.status);
+    auto const document = zep::JsonOf(run);
+    EXPECT_EQ(document["type"], orNull(row.type));
+    EXPECT_EQ(document["model"], orNull(row.model));
+    EXPECT_EQ(document["serialNumber"], orNull(row.serialNumber));
+    EXPECT_EQ(document.value("error", nlohmann::json(nullptr)), orNull(row.error));
+  }
+}
+
 TEST_F(ZepRemoteTest, ThePasswordReachesNeitherOutputNorLog) {
   TSimulator simulator({});
   simulator.WaitUntilReady();
