@@ -56,14 +56,17 @@ bool IsController(std::vector<TInterface>::value_type const& interface, std::str
          std::all_of(interface.addresses.begin(), interface.addresses.end(), IsLinkLocal);
 }
 
+TInterface InterfaceNamed(std::string const& name, std::vector<TInterface> const& all) {
+  auto const found = std::find_if(all.begin(), all.end(), [&](TInterface const& interface) { return interface.name == name; });
+  return found != all.end() ? *found : TInterface{name, false, {}, false};
+}
+
+// One that is missing keeps its place: the others stay the nodes that they are.
 std::vector<TInterface> Named(std::vector<TInterface> const& all, std::string const& names) {
-  std::vector<TInterface> found;
+  std::vector<TInterface> named;
   std::istringstream words(names);
-  for (std::string name; words >> name;) {
-    auto const place = std::find_if(all.begin(), all.end(), [&](TInterface const& interface) { return interface.name == name; });
-    if (place != all.end()) found.push_back(*place);
-  }
-  return found;
+  for (std::string name; words >> name;) named.push_back(InterfaceNamed(name, all));
+  return named;
 }
 
 // The request to add an address, as the kernel's route socket takes it.

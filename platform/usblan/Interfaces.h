@@ -18,6 +18,7 @@ struct TInterface {
   std::string name;
   bool isUp = false;
   std::vector<TAddress> addresses = {};
+  bool isThere = true;  // false: named, but the machine does not have it
 };
 
 // The controller's address of a node, and the address that this side gets; both within a network of 24 bits.
@@ -31,8 +32,9 @@ std::vector<TInterface> AllInterfaces();
 // Whether the interface is a USB network interface, by what the kernel tells below `classNet` ("/sys/class/net").
 bool IsUsbNetwork(std::string const& classNet, std::string const& name);
 
-// Those of `all` that lead to a controller, in the order of the nodes: the ones that `named` names, separated by blanks; with
-// an empty `named` the USB network interfaces without an address outside of the link-local range.
+// The interfaces that lead to a controller: the place of each is its node. The ones that `named` names, separated by blanks,
+// whether `all` has them or not; with an empty `named` the USB network interfaces of `all` without an address outside of the
+// link-local range.
 std::vector<TInterface> ControllerInterfaces(std::vector<TInterface> const& all, std::string const& named,
                                              std::string const& classNet);
 

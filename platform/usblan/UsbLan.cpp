@@ -24,6 +24,7 @@ int BringUp(int node) {
   const std::vector<usblan::TInterface> nodes = Nodes();
   if (!IsNode(nodes, node)) return ENODEV;
   usblan::TInterface const& interface = nodes[static_cast<std::size_t>(node)];
+  if (!interface.isThere) return ENODEV;
   if (usblan::Reaches(interface, node)) return 0;
   usblan::TakeUp(interface);
   usblan::AddOwnAddress(interface, node);

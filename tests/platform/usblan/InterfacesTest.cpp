@@ -90,8 +90,17 @@ TEST_F(ControllerInterfacesTest, NamedOnesCountInTheirOrder) {
   AddInterface("usb0", "cdc_ether");
   std::vector<TInterface> const all = {{"usb0"}, {"veth0", true, {{Ip(10, 0, 0, 1), k24}}}, {"veth1"}};
   EXPECT_THAT(Found(all, "veth1 veth0"), ElementsAre("veth1", "veth0"));
-  EXPECT_THAT(Found(all, "  veth1   absent "), ElementsAre("veth1"));
+  EXPECT_THAT(Found(all, "  veth1   veth0 "), ElementsAre("veth1", "veth0"));
   EXPECT_THAT(Found(all, " "), IsEmpty());
+}
+
+TEST_F(ControllerInterfacesTest, ANamedOneThatIsMissingKeepsItsPlace) {
+  std::vector<TInterface> const nodes = ControllerInterfaces({{"veth0"}, {"veth1"}}, "absent veth1 gone veth0", dir_.Path());
+  ASSERT_EQ(nodes.size(), 4u);
+  for (std::size_t node : {0, 2}) EXPECT_FALSE(nodes[node].isThere) << node;
+  EXPECT_EQ(nodes[1].name, "veth1");
+  EXPECT_TRUE(nodes[1].isThere);
+  EXPECT_EQ(nodes[3].name, "veth0");
 }
 
 TEST_F(ControllerInterfacesTest, ThereAreNoMoreThan16) {

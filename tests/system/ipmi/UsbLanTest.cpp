@@ -76,6 +76,21 @@ TEST_F(UsbLanTest, AnInterfaceGetsAnAddressInTheControllersRange) {
   }
 }
 
+TEST_F(UsbLanTest, AMissingInterfaceMovesNoOtherToItsNode) {
+  RunShell("ip link add bmc0 type veth peer name bmc1 && ip link add verylongname012 type veth peer name far0");
+  ::setenv("ZEP_USBLAN_INTERFACES", "absent bmc0 verylongname0123 bmc1", 1);
+  EXPECT_EQ(nodes_(), 4);
+  for (int missing : {0, 2}) {
+    EXPECT_EQ(query_(missing), 0) << missing;
+    EXPECT_EQ(bringUp_(missing), ENODEV) << missing;
+  }
+  EXPECT_EQ(bringUp_(1), 0);
+  EXPECT_EQ(bringUp_(3), 0);
+  EXPECT_EQ(AddressesOf("bmc0"), "169.254.96.1/24 ");
+  EXPECT_EQ(AddressesOf("bmc1"), "169.254.98.1/24 ");
+  EXPECT_EQ(AddressesOf("verylongname012"), "") << "its name is only the beginning of one that is missing";
+}
+
 TEST_F(UsbLanTest, OtherAddressesStay) {
   RunShell(
       "ip link add bmc0 type veth peer name far0 && ip addr add 10.1.2.3/24 dev bmc0 && ip addr add 169.254.95.1/24 dev bmc0");
