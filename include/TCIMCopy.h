@@ -29,9 +29,10 @@ class TCIMReference;
 //
 // A property declaration that throws TZEPException is logged, at debug severity, and left out. Any other failure (a class
 // that is there already, a superclass that is not, a static value whose declaration was left out, whatever a plug-in throws)
-// passes through and ends the copy; what was made in the destination by then stays. What the destination answers with an
-// empty pointer for counts as kZEPStatusNotFound; an empty pointer that the caller passes is a failed assertion. Only
-// CopyInstance takes a lock.
+// passes through and ends the copy; what was made in the destination by then stays. An empty pointer returned by the
+// destination is treated as kZEPStatusNotFound, before anything else is done; only its GetPropertyDecl may return one, for a
+// property that is not declared yet. An empty pointer that the caller passes is a failed assertion. Only CopyInstance takes
+// a lock.
 class ZEP_EXPORT TCIMCopy {
 public:
   // Qualifier declarations, then the classes whose flag (ICIMClass::GetClassFlag) is not set, then those whose flag is, so

@@ -1,12 +1,12 @@
 #include "TCIMCopy.h"
 
+#include "Answers.h"
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
 #include "ICIMMethodDecl.h"
 #include "ICIMNamespace.h"
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
-#include "TZEPException.h"
 
 #include <vector>
 
@@ -22,9 +22,7 @@ constexpr bool kPlainClasses = false, kAssociations = true;
 
 // The class of that name. A namespace may answer an unknown name with an empty pointer, too.
 boost::shared_ptr<ICIMClass> ClassIn(ICIMNamespace const& dst, std::string const& name) {
-  const boost::shared_ptr<ICIMClass> cls = dst.GetClass(name, TCIMContext());
-  if (!cls) throw TZEPException(kZEPStatusNotFound);
-  return cls;
+  return Required(dst.GetClass(name, TCIMContext()));
 }
 
 boost::shared_ptr<ICIMClass> SuperClassIn(ICIMNamespace const& dst, ICIMClass const& cls) {
@@ -90,7 +88,7 @@ void TCIMCopy::CopyClasses(boost::shared_ptr<ICIMNamespace> src, boost::shared_p
 
 void TCIMCopy::CopyClass(boost::shared_ptr<ICIMClass> cls, boost::shared_ptr<ICIMNamespace> dst) {
   const boost::shared_ptr<ICIMClass> superClass = SuperClassIn(*dst, *cls);
-  const boost::shared_ptr<ICIMClass> copy = dst->CreateClass(superClass, cls->GetName(TCIMContext()), TCIMContext());
+  const boost::shared_ptr<ICIMClass> copy = Required(dst->CreateClass(superClass, cls->GetName(TCIMContext()), TCIMContext()));
   cls->EnumerateQualifiers(TCopyQualifier(dst, copy), TCIMContext());
   CopyPropertyDecls(*cls, copy, dst);
   cls->EnumerateStaticProperties(TCopyStaticProperty(dst, copy), TCIMContext());
@@ -101,7 +99,7 @@ void TCIMCopy::CopyInstance(boost::shared_ptr<ICIMInstance> inst, boost::shared_
   const boost::recursive_mutex::scoped_lock lock(copyInstMutex);
   const std::string className = inst->GetClass(TCIMContext())->GetName(TCIMContext());
   const boost::shared_ptr<ICIMClass> cls = ClassIn(*dst, className);
-  const boost::shared_ptr<ICIMInstance> copy = cls->CreateInstance(TCIMContext());
+  const boost::shared_ptr<ICIMInstance> copy = Required(cls->CreateInstance(TCIMContext()));
   inst->EnumerateProperties(TCopyInstanceProperty(dst, copy), TCIMContext());
   cls->CommitInstance(copy, TCIMContext());
 }

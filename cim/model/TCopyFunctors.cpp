@@ -2,6 +2,7 @@
 
 #include "TCIMCopy.h"
 
+#include "Answers.h"
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
 #include "ICIMMethodDecl.h"
@@ -72,7 +73,7 @@ bool TCopyQualifierDecls::operator()(boost::shared_ptr<ICIMQualifierDecl> declar
   const TCIMValue defaultValue = TypedDefault(declaration->GetType(none), declaration->GetDefaultValue(none));
   const unsigned int scope = declaration->GetScope(none);
   const unsigned int flavor = declaration->GetFlavor(none);
-  Lock(fDestination)->CreateQualifierDecl(name, defaultValue, scope, flavor, none);
+  Required(Lock(fDestination)->CreateQualifierDecl(name, defaultValue, scope, flavor, none));
   return true;
 }
 
@@ -110,9 +111,9 @@ TCopyQualifier::TCopyQualifier(boost::weak_ptr<ICIMNamespace> destination, boost
 
 bool TCopyQualifier::operator()(boost::shared_ptr<ICIMQualifier> qualifier) {
   const TCIMContext none;
-  const boost::shared_ptr<ICIMQualifierDecl> declaration = Lock(fDestination)->GetQualifierDecl(qualifier->GetName(none), none);
-  if (!declaration) throw TZEPException(kZEPStatusNotFound);
-  fTarget->AddQualifier(declaration, qualifier->GetValue(none), qualifier->GetFlavor(none), none);
+  const boost::shared_ptr<ICIMQualifierDecl> declaration =
+      Required(Lock(fDestination)->GetQualifierDecl(qualifier->GetName(none), none));
+  Required(fTarget->AddQualifier(declaration, qualifier->GetValue(none), qualifier->GetFlavor(none), none));
   return true;
 }
 
@@ -136,7 +137,7 @@ void TCopyPropertyDecl::Copy(ICIMPropertyDecl const& declaration) {
   declaration.GetQualifier(kOverrideQualifier, none);
 
   const TCIMValue defaultValue = TCIMCopy::CopyValue(declaration.GetDefaultValue(none), Lock(fDestination));
-  const boost::shared_ptr<ICIMPropertyDecl> copy = fTarget->AddPropertyDecl(name, defaultValue, none);
+  const boost::shared_ptr<ICIMPropertyDecl> copy = Required(fTarget->AddPropertyDecl(name, defaultValue, none));
   CopyQualifiers(declaration, fDestination, copy);
 }
 
@@ -156,7 +157,7 @@ TCopyMethodDecl::TCopyMethodDecl(boost::weak_ptr<ICIMNamespace> destination, boo
 bool TCopyMethodDecl::operator()(boost::shared_ptr<ICIMMethodDecl> declaration) {
   const TCIMContext none;
   const boost::shared_ptr<ICIMMethodDecl> copy =
-      fTarget->AddMethodDecl(declaration->GetName(none), declaration->GetReturnType(none), none);
+      Required(fTarget->AddMethodDecl(declaration->GetName(none), declaration->GetReturnType(none), none));
   CopyQualifiers(*declaration, fDestination, copy);
   TCopyParameterDecl copyParameter(fDestination, copy);
   declaration->EnumerateParameterDecls(boost::ref(copyParameter), none);
@@ -169,8 +170,8 @@ TCopyParameterDecl::TCopyParameterDecl(boost::weak_ptr<ICIMNamespace> destinatio
 bool TCopyParameterDecl::operator()(boost::shared_ptr<ICIMParameterDecl> declaration) {
   const TCIMContext none;
   const boost::shared_ptr<ICIMParameterDecl> copy =
-      fTarget->AddParameterDecl(declaration->GetName(none), declaration->GetType(none), declaration->GetMaxArraySize(none),
-                                declaration->GetReferencedClassName(none), none);
+      Required(fTarget->AddParameterDecl(declaration->GetName(none), declaration->GetType(none),
+                                         declaration->GetMaxArraySize(none), declaration->GetReferencedClassName(none), none));
   CopyQualifiers(*declaration, fDestination, copy);
   return true;
 }
@@ -184,8 +185,7 @@ bool TCopyInstanceProperty::operator()(boost::shared_ptr<ICIMProperty> property)
   const TCIMContext none;
   const TCIMValue value = property->GetValue(none);
   if (value.IsNull()) return true;
-  const boost::shared_ptr<ICIMProperty> copy = fTarget->GetProperty(property->GetName(none), none);
-  if (!copy) throw TZEPException(kZEPStatusNotFound);
+  const boost::shared_ptr<ICIMProperty> copy = Required(fTarget->GetProperty(property->GetName(none), none));
   copy->SetValue(TCIMCopy::CopyValue(value, Lock(fDestination)), none);
   return true;
 }

@@ -4,6 +4,7 @@
 #include "providers/memory/TMemoryClass.h"
 #include "tests/providers/memory/Collect.h"
 
+#include <algorithm>
 #include <atomic>
 #include <chrono>
 #include <stdexcept>
@@ -217,6 +218,58 @@ TEST_F(TCIMCopyTest, AnEmptyAnswerForAClassCountsAsNotFound) {
   EXPECT_STATUS(TCIMCopy::CopyValue(instance->GetReference(), destination), kZEPStatusNotFound);
   EXPECT_THAT(trace_.fCalls, ElementsAre("GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A"));
   EXPECT_THAT(ClassNames(*copy_), IsEmpty());
+}
+
+// A class X_B with one of everything that can be made in a destination, below X_A, and the product class with an instance.
+boost::shared_ptr<TMemoryNamespace> SourceOfEverything() {
+  const auto source = NewNamespace();
+  source->DefineClass("X_A");
+  source->DefineClass("X_B", "X_A")
+      .Description("b")
+      .Property("Name", "string")
+      .Description("n")
+      .Property("Size", "uint64")
+      .Method("Reset", "uint32")
+      .Description("r")
+      .In("Force", "boolean")
+      .Method("Stop", "uint32");
+  source->DefineClass("QRVSG_ZEPProduct").Key("Name", "string");
+  source->AddInstance("QRVSG_ZEPProduct", {{"Name", "zep"}});
+  return source;
+}
+
+TEST_F(TCIMCopyTest, AnyEmptyAnswerOfTheDestinationIsNotFoundBeforeAnythingElseIsDone) {
+  for (std::string const call :
+       {"CreateQualifierDecl dst:Key", "GetClass dst:X_A", "CreateClass dst:X_A", "CreateClass dst:X_B under X_A",
+        "GetQualifierDecl dst:Description", "AddQualifier dst:X_B Description", "AddMethodDecl dst:X_B.Reset",
+        "AddQualifier dst:X_B.Reset Description", "AddParameterDecl dst:X_B.Reset.Force", "AddQualifier dst:X_B.Reset.Force In",
+        "GetClass dst:QRVSG_ZEPProduct", "CreateInstance dst:QRVSG_ZEPProduct", "GetProperty dst:QRVSG_ZEPProduct.Name"}) {
+    SCOPED_TRACE(call);
+    TTrace trace;
+    trace.fEmptyAnswer = call;
+    const auto copy = NewNamespace();
+    EXPECT_STATUS(TCIMCopy::CopyClasses(boost::make_shared<TTracedNamespace>(trace, SourceOfEverything(), "src"),
+                                        boost::make_shared<TTracedNamespace>(trace, copy, "dst"), false),
+                  kZEPStatusNotFound);
+    EXPECT_EQ(trace.fCalls.back(), call);
+  }
+}
+
+TEST_F(TCIMCopyTest, AnEmptyAnswerWhileAPropertyIsDeclaredLeavesOneLineAndTheOthersAreCopied) {
+  for (std::string const call : {"AddPropertyDecl dst:X_B.Name", "AddQualifier dst:X_B.Name Description"}) {
+    SCOPED_TRACE(call);
+    TTrace trace;
+    trace.fEmptyAnswer = call;
+    const auto copy = NewNamespace();
+    OnNewThread([&] {
+      const TLogCapture log;
+      TCIMCopy::CopyClasses(SourceOfEverything(), boost::make_shared<TTracedNamespace>(trace, copy, "dst"), false);
+      EXPECT_THAT(log.Entries(), ElementsAre(kLine));
+    });
+    EXPECT_TRUE(Decl(*copy, "X_B", "Size"));
+    const auto next = std::find(trace.fCalls.begin(), trace.fCalls.end(), call) + 1;
+    EXPECT_EQ(*next, "GetPropertyDecl dst:X_B.Size");
+  }
 }
 
 TEST_F(TCIMCopyTest, ARootClassLooksUpNoSuperclass) {

@@ -26,6 +26,7 @@ namespace NQRVZEP20 {
 struct TTrace {
   std::vector<std::string> fCalls;
   std::map<std::string, std::function<void()>> fOnCall;  // what happens before the call is passed on
+  std::string fEmptyAnswer;                              // the call that is answered with an empty pointer and not passed on
   bool fAnswersUnknownClassByEmpty = false;
   std::size_t fContextEntries = 0;  // that were handed over in all calls
 
@@ -34,6 +35,12 @@ struct TTrace {
     fContextEntries += context.size();
     auto const found = fOnCall.find(call);
     if (found != fOnCall.end()) found->second();
+  }
+
+  // The same for a call that returns a pointer; false when it is to be answered with an empty one.
+  bool RecordQuery(std::string const& call, TCIMContext const& context) {
+    Record(call, context);
+    return call != fEmptyAnswer;
   }
 };
 
@@ -55,7 +62,9 @@ public:
   }
   boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                 unsigned int flavor, TCIMContext const& context) override {
-    fTrace.Record("AddQualifier " + fPath + " " + (declaration ? declaration->GetName(context) : "of no declaration"), context);
+    if (!fTrace.RecordQuery("AddQualifier " + fPath + " " + (declaration ? declaration->GetName(context) : "of no declaration"),
+                            context))
+      return {};
     return fInner->AddQualifier(declaration, value, flavor, context);
   }
 
@@ -96,7 +105,7 @@ public:
   TCIMValue::TCIMType GetReturnType(TCIMContext const& context) const override { return fInner->GetReturnType(context); }
   boost::shared_ptr<ICIMParameterDecl> AddParameterDecl(std::string const& name, TCIMValue::TCIMType type, unsigned int size,
                                                         std::string const& className, TCIMContext const& context) override {
-    fTrace.Record("AddParameterDecl " + fPath + "." + name, context);
+    if (!fTrace.RecordQuery("AddParameterDecl " + fPath + "." + name, context)) return {};
     return boost::make_shared<TTracedParameterDecl>(fTrace, fInner->AddParameterDecl(name, type, size, className, context),
                                                     fPath + "." + name);
   }
@@ -118,7 +127,7 @@ public:
     return fInner->GetClass(context);
   }
   boost::shared_ptr<ICIMProperty> GetProperty(std::string const& name, TCIMContext const& context) const override {
-    fTrace.Record("GetProperty " + fPath + "." + name, context);
+    if (!fTrace.RecordQuery("GetProperty " + fPath + "." + name, context)) return {};
     return fInner->GetProperty(name, context);
   }
   void EnumerateProperties(boost::function<bool(boost::shared_ptr<ICIMProperty>)> callback,
@@ -169,7 +178,7 @@ public:
   }
   boost::shared_ptr<ICIMPropertyDecl> AddPropertyDecl(std::string const& name, TCIMValue const& defaultValue,
                                                       TCIMContext const& context) override {
-    fTrace.Record("AddPropertyDecl " + fPath + "." + name, context);
+    if (!fTrace.RecordQuery("AddPropertyDecl " + fPath + "." + name, context)) return {};
     return boost::make_shared<TTracedPropertyDecl>(fTrace, fInner->AddPropertyDecl(name, defaultValue, context),
                                                    fPath + "." + name);
   }
@@ -198,7 +207,7 @@ public:
   }
 
   boost::shared_ptr<ICIMInstance> CreateInstance(TCIMContext const& context) override {
-    fTrace.Record("CreateInstance " + fPath, context);
+    if (!fTrace.RecordQuery("CreateInstance " + fPath, context)) return {};
     return boost::make_shared<TTracedInstance>(fTrace, fInner->CreateInstance(context), fPath);
   }
   void EnumerateInstances(boost::function<bool(boost::shared_ptr<ICIMInstance>)> callback,
@@ -217,7 +226,7 @@ public:
 
   boost::shared_ptr<ICIMMethodDecl> AddMethodDecl(std::string const& name, TCIMValue::TCIMType returnType,
                                                   TCIMContext const& context) override {
-    fTrace.Record("AddMethodDecl " + fPath + "." + name, context);
+    if (!fTrace.RecordQuery("AddMethodDecl " + fPath + "." + name, context)) return {};
     return boost::make_shared<TTracedMethodDecl>(fTrace, fInner->AddMethodDecl(name, returnType, context), fPath + "." + name);
   }
   void EnumerateMethodDecls(boost::function<bool(boost::shared_ptr<ICIMMethodDecl>)> callback,
@@ -246,11 +255,12 @@ public:
   boost::shared_ptr<ICIMClass> CreateClass(boost::shared_ptr<ICIMClass> superClass, std::string const& name,
                                            TCIMContext const& context) override {
     auto const traced = boost::dynamic_pointer_cast<TTracedClass>(superClass);
-    fTrace.Record("CreateClass " + fLabel + name + (traced ? " under " + traced->GetName(context) : ""), context);
+    if (!fTrace.RecordQuery("CreateClass " + fLabel + name + (traced ? " under " + traced->GetName(context) : ""), context))
+      return {};
     return Wrap(fInner->CreateClass(traced ? traced->Inner() : superClass, name, context));
   }
   boost::shared_ptr<ICIMClass> GetClass(std::string const& name, TCIMContext const& context) const override {
-    fTrace.Record("GetClass " + fLabel + name, context);
+    if (!fTrace.RecordQuery("GetClass " + fLabel + name, context)) return {};
     try {
       return Wrap(fInner->GetClass(name, context));
     } catch (TZEPException const&) {
@@ -265,11 +275,11 @@ public:
   boost::shared_ptr<ICIMQualifierDecl> CreateQualifierDecl(std::string const& name, TCIMValue const& defaultValue,
                                                            unsigned int scope, unsigned int flavor,
                                                            TCIMContext const& context) override {
-    fTrace.Record("CreateQualifierDecl " + fLabel + name, context);
+    if (!fTrace.RecordQuery("CreateQualifierDecl " + fLabel + name, context)) return {};
     return fInner->CreateQualifierDecl(name, defaultValue, scope, flavor, context);
   }
   boost::shared_ptr<ICIMQualifierDecl> GetQualifierDecl(std::string const& name, TCIMContext const& context) const override {
-    fTrace.Record("GetQualifierDecl " + fLabel + name, context);
+    if (!fTrace.RecordQuery("GetQualifierDecl " + fLabel + name, context)) return {};
     return fInner->GetQualifierDecl(name, context);
   }
   void EnumerateQualifierDecls(boost::function<bool(boost::shared_ptr<ICIMQualifierDecl>)> callback,
