@@ -1,8 +1,11 @@
 #include "TMofSources.h"
 
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
 #include <algorithm>
 #include <cerrno>
-#include <fstream>
 #include <system_error>
 
 namespace NQRVZEP20 {
@@ -29,14 +32,42 @@ fs::path RegularFile(fs::path const& path, int& error) {
   return error == 0 ? canonical : fs::path();
 }
 
-bool ReadWhole(fs::path const& path, std::string& text) {
-  std::ifstream file(path, std::ios::binary);
-  if (!file) return false;
-  file.seekg(0, std::ios::end);
-  text.resize(static_cast<std::size_t>(std::max<std::streamoff>(file.tellg(), 0)));
-  file.seekg(0);
-  file.read(text.data(), static_cast<std::streamsize>(text.size()));
-  return static_cast<bool>(file);
+// An open file, closed when it goes out of scope.
+class TOpenFile {
+public:
+  explicit TOpenFile(fs::path const& path) : fFd(::open(path.c_str(), O_RDONLY | O_CLOEXEC)) {}
+  TOpenFile(TOpenFile const&) = delete;
+  TOpenFile& operator=(TOpenFile const&) = delete;
+  ~TOpenFile() {
+    if (fFd >= 0) ::close(fFd);
+  }
+  int Get() const { return fFd; }
+
+private:
+  int const fFd;
+};
+
+// Reads up to the end of the file, whatever its size is said to be: one that changes meanwhile, or tells no size, is neither
+// cut nor padded. Returns 0, or the error of the system that ended the reading; `text` is of no use then.
+int ReadWhole(fs::path const& path, std::string& text) {
+  constexpr std::size_t kLeast = 4096;
+  TOpenFile const file(path);
+  if (file.Get() < 0) return errno;
+  struct stat status = {};
+  if (::fstat(file.Get(), &status) != 0) return errno;
+
+  // One byte more than its size, so that the end is seen without growing.
+  text.resize(std::max(static_cast<std::size_t>(status.st_size) + 1, kLeast));
+  std::size_t size = 0;
+  for (;;) {
+    const ssize_t got = ::read(file.Get(), text.data() + size, text.size() - size);
+    if (got < 0) return errno;
+    if (got == 0) break;
+    size += static_cast<std::size_t>(got);
+    if (size == text.size()) text.resize(2 * size);
+  }
+  text.resize(size);
+  return 0;
 }
 
 bool IsWithin(fs::path const& folder, fs::path const& path) {
@@ -49,7 +80,7 @@ TMofFile const& TMofSources::OpenFirst(std::string const& path) {
   int error = 0;
   const fs::path canonical = RegularFile(path, error);
   std::string text;
-  if (error == 0 && !ReadWhole(canonical, text)) error = errno != 0 ? errno : EIO;
+  if (error == 0) error = ReadWhole(canonical, text);
   if (error != 0) throw TMofError(path + ": cannot be read: " + ReasonOf(error), StatusOf(error));
   fFolder = canonical.parent_path();
   fOpen.push_back({canonical, path});
@@ -70,7 +101,7 @@ TMofFile const& TMofSources::OpenIncluded(std::string const& name, TMofPlace con
   if (error == 0 && std::any_of(fOpen.begin(), fOpen.end(), isIt)) throw TMofError(directive, "the file includes itself");
 
   std::string text;
-  if (error == 0 && !ReadWhole(canonical, text)) error = errno != 0 ? errno : EIO;
+  if (error == 0) error = ReadWhole(canonical, text);
   if (error != 0) throw TMofError(directive, "the included file cannot be read: " + ReasonOf(error), StatusOf(error));
   fOpen.push_back({canonical, fOpen.back().fName.parent_path() / name});
   return Add(fOpen.back().fName.string(), std::move(text));

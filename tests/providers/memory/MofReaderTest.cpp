@@ -3,8 +3,36 @@
 #include "Mof.h"
 #include "TMofError.h"
 
+#include <sys/types.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
 #include <filesystem>
 #include <limits>
+
+// While one lives, every file fails with that error once so many bytes of it were read.
+class TReadFault {
+public:
+  TReadFault(std::size_t readable, int error) {
+    gReadable = readable;
+    gError = error;
+  }
+  ~TReadFault() { gError = 0; }
+
+  static inline std::size_t gReadable = 0;
+  static inline int gError = 0;
+};
+
+// The linker puts these in the place of read.
+extern "C" ssize_t __real_read(int fd, void* buffer, std::size_t size);
+extern "C" ssize_t __wrap_read(int fd, void* buffer, std::size_t size) {
+  if (TReadFault::gError == 0) return __real_read(fd, buffer, size);
+  const auto position = static_cast<std::size_t>(::lseek(fd, 0, SEEK_CUR));
+  if (position < TReadFault::gReadable) return __real_read(fd, buffer, std::min(size, TReadFault::gReadable - position));
+  errno = TReadFault::gError;
+  return -1;
+}
 
 namespace NQRVZEP20 {
 namespace {
@@ -603,6 +631,33 @@ TEST_F(MofFileTest, WhatCannotBeReadIsToldWithItsReason) {
   EXPECT_EQ(Result(), "all.mof:1:18: the included file cannot be read: Is a directory");
   EXPECT_EQ(StatusOf([&] { ReadMofFile(dir_.Path("nothing"), NewNamespace()); }), kZEPStatusFileNotFound);
   EXPECT_EQ(StatusOf([&] { ReadMofFile(dir_.Path("schema"), NewNamespace()); }), kZEPStatusFileSystemError);
+}
+
+TEST_F(MofFileTest, AReadErrorInTheMiddleOfAFileIsItsOwnFailureAndNothingIsUsed) {
+  const std::string text = "class X_1 { };\nclass X_2 { };\n";
+  Write("all.mof", text);
+  for (const std::size_t readable : {std::size_t(0), text.find('\n') + 1, text.size()}) {  // each a text of its own right
+    SCOPED_TRACE(readable);
+    const TReadFault fault(readable, EIO);
+    const auto ns = NewNamespace();
+    EXPECT_EQ(StatusOf([&] { ReadMofFile(dir_.Path("schema/all.mof"), ns); }), kZEPStatusFileSystemError);
+    EXPECT_THAT(ClassNames(*ns), IsEmpty());
+    EXPECT_EQ(Result(), "all.mof: cannot be read: Input/output error");
+  }
+  EXPECT_EQ(Result(), "X_1 X_2 ");
+}
+
+TEST_F(MofFileTest, AReadErrorInAnIncludedFileNamesTheDirective) {
+  Write("all.mof", "#pragma include (\"a.mof\")\n");
+  Write("a.mof", std::string(100, ' ') + "class X_1 { };");
+  const TReadFault fault(60, EIO);
+  EXPECT_EQ(Result(), "all.mof:1:18: the included file cannot be read: Input/output error");
+}
+
+// The memory of a process is a file without size, whose first bytes cannot be read.
+TEST_F(MofFileTest, AFileThatTellsNoSizeIsReadAllTheSame) {
+  EXPECT_EQ(StatusOf([] { ReadMofFile("/proc/self/mem", NewNamespace()); }), kZEPStatusFileSystemError);
+  EXPECT_EQ(StatusOf([] { ReadMofFile("/proc/self/status", NewNamespace()); }), kZEPStatusInvalidFormat);
 }
 
 TEST_F(MofFileTest, AnEmptyFileDeclaresNothing) {
