@@ -1,5 +1,5 @@
 // Reads any bytes as an SMBIOS structure of every type that the host provider knows: each record has its shape, and each
-// property a value or a reason.
+// property a value or a reason. The same bytes are read as an entry point.
 
 #include "fuzz/Require.h"
 #include "providers/host/SmbiosRecords.h"
@@ -30,6 +30,7 @@ void ReadAsEveryRecord(TSmbiosStructure const& structure) {
 }  // namespace NQRVZEP20
 
 extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
+  static_cast<void>(NQRVZEP20::VersionInEntryPoint({reinterpret_cast<char const*>(data), size}));
   NQRVZEP20::ReadAsEveryRecord(NQRVZEP20::TSmbiosStructure(std::vector<unsigned char>(data, data + size)));
   return 0;
 }

@@ -56,19 +56,31 @@ inline std::string WithCheckSum(std::string entryPoint, std::size_t offset, std:
   return entryPoint;
 }
 
+inline std::string Version(int version) { return LittleEndian(version >> 8, 1) + LittleEndian(version & 0xFF, 1); }
+
 // Entry points as `dmidecode --dump-bin` puts them in front of a table, filled up to 32 bytes.
-inline std::string EntryPoint32(std::size_t tableSize, std::size_t tableAddress = 32, int length = 0x1F) {
+// The version is major and minor, 0x208 for 2.8.
+inline std::string EntryPoint32(std::size_t tableSize, std::size_t tableAddress = 32, int length = 0x1F, int version = 0x208) {
   std::string const inner = "_DMI_\0"s + LittleEndian(tableSize, 2) + LittleEndian(tableAddress, 4) + "\0\0\x28\0"s;
-  std::string entry = "_SM_\0"s + LittleEndian(length, 1) + "\2\x8"s + std::string(8, '\0') + inner;
+  std::string entry = "_SM_\0"s + LittleEndian(length, 1) + Version(version) + std::string(8, '\0') + inner;
   entry.resize(32);
   return WithCheckSum(WithCheckSum(entry, 0x15, 0x10, 0x0F), 4, 0, length);
 }
 
-inline std::string EntryPoint64(std::size_t tableSize, unsigned long long tableAddress = 32, int length = 0x18) {
-  std::string entry =
-      "_SM3_\0"s + LittleEndian(length, 1) + "\3\3\0\1\0"s + LittleEndian(tableSize, 4) + LittleEndian(tableAddress, 8);
+inline std::string EntryPoint64(std::size_t tableSize, unsigned long long tableAddress = 32, int length = 0x18,
+                                int version = 0x303) {
+  std::string entry = "_SM3_\0"s + LittleEndian(length, 1) + Version(version) + "\0\1\0"s + LittleEndian(tableSize, 4) +
+                      LittleEndian(tableAddress, 8);
   entry.resize(32);
   return WithCheckSum(entry, 5, 0, length);
+}
+
+// That of before SMBIOS 2.1, whose version is one byte: 0x20 for 2.0.
+inline std::string EntryPointLegacy(std::size_t tableSize, std::size_t tableAddress = 32, int version = 0x20) {
+  std::string entry =
+      "_DMI_\0"s + LittleEndian(tableSize, 2) + LittleEndian(tableAddress, 4) + "\0\0"s + LittleEndian(version, 1);
+  entry.resize(32);
+  return WithCheckSum(entry, 5, 0, 0x0F);
 }
 
 // A process's standard output.

@@ -57,6 +57,12 @@ bool IsInnerPartSound(std::string_view entryPoint) {
   return StartsWith(inner, "_DMI_"sv) && IsSumZero(inner);
 }
 
+// The table at that address of a file, if the address lies after the entry point, cut where the file ends.
+std::string_view TableAt(std::string_view file, std::uint64_t address, std::size_t entryPointLength, std::uint64_t size) {
+  if (address < entryPointLength || address > file.size()) return {};
+  return file.substr(address, size);
+}
+
 std::string_view TableNamedBy(TEntryPointLayout const& layout, std::string_view file) {
   if (file.size() < layout.maxLength) return {};  // no room for a table behind it
   const std::size_t length = ByteAt(file, layout.lengthOffset);
@@ -65,8 +71,18 @@ std::string_view TableNamedBy(TEntryPointLayout const& layout, std::string_view 
   if (layout.hasInnerPart && !IsInnerPartSound(file)) return {};
 
   const std::uint64_t address = NumberAt(file, layout.tableAddressOffset, layout.tableAddressBytes);
-  if (address < length || address > file.size()) return {};
-  return file.substr(address, NumberAt(file, layout.tableSizeOffset, layout.tableSizeBytes));
+  return TableAt(file, address, length, NumberAt(file, layout.tableSizeOffset, layout.tableSizeBytes));
+}
+
+// The entry point of before SMBIOS 2.1, which has no length byte.
+constexpr std::size_t kLegacyLength = 0x0F;
+
+bool BeginsWithLegacyEntryPoint(std::string_view file) {
+  return StartsWith(file, "_DMI_"sv) && file.size() >= kLegacyLength && IsSumZero(file.substr(0, kLegacyLength));
+}
+
+std::string_view TableNamedByLegacy(std::string_view file) {
+  return TableAt(file, NumberAt(file, 0x08, 4), kLegacyLength, NumberAt(file, 0x06, 2));
 }
 
 }  // namespace
@@ -89,6 +105,7 @@ TStructure TStructureReader::NextOfType(int type) {
 std::string_view DmiTableIn(std::string_view file) {
   if (StartsWith(file, kEntryPoint64.anchor)) return TableNamedBy(kEntryPoint64, file);
   if (StartsWith(file, kEntryPoint32.anchor)) return TableNamedBy(kEntryPoint32, file);
+  if (BeginsWithLegacyEntryPoint(file)) return TableNamedByLegacy(file);
   return file;
 }
 

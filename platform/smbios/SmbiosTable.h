@@ -30,9 +30,9 @@ private:
   std::string_view fRest;  // what is still to be read
 };
 
-// The DMI table in the bytes of a file: all of a bare table; of a file that begins with an entry point ("_SM_" or "_SM3_")
-// the part that this one names, cut where the file ends. Empty when the entry point's anchor, length, checksum or table
-// address cannot be right.
+// The DMI table in the bytes of a file: all of a bare table; of a file that begins with an entry point ("_SM3_", "_SM_" or
+// "_DMI_") the part that this one names, cut where the file ends. Empty when the entry point's anchor, length, checksum or
+// table address cannot be right; but "_DMI_" without a sound checksum may be the start of a bare table, and counts as one.
 std::string_view DmiTableIn(std::string_view file);
 
 }  // namespace smbios

@@ -42,7 +42,7 @@ void FillHostNamespace(TMemoryNamespace& ns) {
   utsname const kernel = Kernel();
   TSystemName const name = SystemNameOf(kernel);
   TSmbiosReader const tables;
-  writer.Write(ComputerSystemRecord(tables.First(kSmbiosSystem), tables.SourceOf(kSmbiosSystem), name));
+  writer.Write(ComputerSystemRecord(tables.First(kSmbiosSystem), tables.SourceOf(kSmbiosSystem), name, tables.Version()));
   writer.Write(OperatingSystemRecord(TOsRelease::OfThisMachine(), kernel, name));
   writer.Write(ProductRecord());
 

@@ -35,17 +35,21 @@ bool AreAll(std::vector<unsigned char> const& bytes, unsigned char value) {
   return std::all_of(bytes.begin(), bytes.end(), [value](unsigned char byte) { return byte == value; });
 }
 
-// The first three fields are little-endian, as all firmware since version 2.6 of the standard (2008) writes them; what is
-// older cannot be told from the structure.
-TFinding<std::string> UuidOf(TSmbiosStructure const& system) {
+// Since version 2.6 of the standard the first three fields are little-endian; before, they stand as they are printed.
+TFinding<std::string> UuidOf(TSmbiosStructure const& system, std::optional<TSmbiosVersion> version) {
   auto const uuid = system.Bytes(0x08, 16);
   if (!uuid) return uuid.Why();
-  auto const& u = *uuid;
+  auto u = *uuid;
   if (AreAll(u, 0x00)) return TMissing{kMissingNotGiven, "the firmware gives none (all zeros)"};
   if (AreAll(u, 0xff)) return TMissing{kMissingNotGiven, "the firmware leaves it to be set (all ones)"};
+  if (!version || *version >= TSmbiosVersion(2, 6)) {
+    std::reverse(u.begin(), u.begin() + 4);
+    std::reverse(u.begin() + 4, u.begin() + 6);
+    std::reverse(u.begin() + 6, u.begin() + 8);
+  }
   char text[37];
-  std::snprintf(text, sizeof text, "%02X%02X%02X%02X-%02X%02X-%02X%02X-%02X%02X-%02X%02X%02X%02X%02X%02X", u[3], u[2], u[1], u[0],
-                u[5], u[4], u[7], u[6], u[8], u[9], u[10], u[11], u[12], u[13], u[14], u[15]);
+  std::snprintf(text, sizeof text, "%02X%02X%02X%02X-%02X%02X-%02X%02X-%02X%02X-%02X%02X%02X%02X%02X%02X", u[0], u[1], u[2], u[3],
+                u[4], u[5], u[6], u[7], u[8], u[9], u[10], u[11], u[12], u[13], u[14], u[15]);
   return WithoutPlaceholder(std::string(text));
 }
 
@@ -294,7 +298,8 @@ TFinding<std::uint32_t> SpeedOf(TSmbiosStructure const& memoryDevice, std::size_
 
 }  // namespace
 
-TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name) {
+TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name,
+                             std::optional<TSmbiosVersion> version) {
   TRecord record(TCIMSchemaHelper::kSystemCreationClassName, name.fSource);
   record.AddKey("CreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
   record.AddKey("Name", name.fName);
@@ -303,7 +308,7 @@ TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& 
   record.Add("ProductName", TextOf(system, 0x05));
   record.Add("Version", TextOf(system, 0x06));
   record.Add("SerialNumber", TextOf(system, 0x07));
-  record.Add("UUID", UuidOf(system));
+  record.Add("UUID", UuidOf(system, version));
   record.Add("SKUNumber", TextOf(system, 0x19));
   record.Add("Family", TextOf(system, 0x1a));
   return record;

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "SmbiosVersion.h"
 #include "TRecord.h"
 #include "TSmbiosStructure.h"
 
@@ -10,7 +11,9 @@ namespace NQRVZEP20 {
 // What SMBIOS structures say, as records of CIM classes: the DMTF's property names, types and numbers. `source` tells where
 // the structure was read. `number` counts the instances of the class, from 0.
 
-TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name);
+// The version decides the byte order of the UUID; without one, it is that of versions since 2.6.
+TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name,
+                             std::optional<TSmbiosVersion> version = std::nullopt);
 TRecord BiosRecord(TSmbiosStructure const& bios, std::string const& source, unsigned number);
 TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source, unsigned number);
 TRecord ProcessorRecord(TSmbiosStructure const& processor, std::string const& source, unsigned number, TSystemName const& name);

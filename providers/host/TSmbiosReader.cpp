@@ -12,6 +12,7 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr char const* kTableFileVariable = "ZEP_SMBIOS_TABLE";
+constexpr char const* kKernelTable = "/sys/firmware/dmi/tables/DMI";
 constexpr char const* kLibraryName = "libsmbios.so";
 
 constexpr std::size_t kLargestStructure = 64 * 1024;  // what is longer is cut
@@ -130,6 +131,10 @@ std::vector<TSmbiosStructure> TSmbiosReader::All(int type) const {
     structures.emplace_back(std::move(bytes));
   }
   return structures;
+}
+
+std::optional<TSmbiosVersion> TSmbiosReader::Version() const {
+  return VersionOfTables(fTableFile.empty() ? kKernelTable : fTableFile);
 }
 
 std::string TSmbiosReader::SourceOf(int type) const {

@@ -123,11 +123,12 @@ TEST_F(SmbiosLibraryTest, ReadsRealTables) {
   }
 }
 
-TEST_F(SmbiosLibraryTest, ReadsDumpsWithEitherEntryPoint) {
+TEST_F(SmbiosLibraryTest, ReadsDumpsWithAnyEntryPoint) {
   std::string const table = RealTable("full");
   std::string const system = First(Open(table), 1);
   EXPECT_EQ(First(Open(EntryPoint32(table.size()) + table), 1), system);
   EXPECT_EQ(First(Open(EntryPoint64(table.size()) + table), 1), system);
+  EXPECT_EQ(First(Open(EntryPointLegacy(table.size()) + table), 1), system);
 }
 
 TEST_F(SmbiosLibraryTest, LoadSaysWhyItFails) {

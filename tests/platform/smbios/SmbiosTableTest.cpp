@@ -166,6 +166,8 @@ TEST(SmbiosTableTest, ABareTableIsAllOfTheFile) {
   for (std::string const& name : kRealTables) EXPECT_EQ(DmiTableIn(RealTable(name)), RealTable(name)) << name;
   EXPECT_EQ(DmiTableIn("_SM"), "_SM");
   EXPECT_EQ(DmiTableIn("_DMI_"), "_DMI_");
+  std::string const noEntryPoint = "_DMI_" + std::string(100, 'x');
+  EXPECT_EQ(DmiTableIn(noEntryPoint), noEntryPoint) << "a structure of type 95";
   EXPECT_TRUE(DmiTableIn("").empty());
 }
 
@@ -183,6 +185,9 @@ TEST(SmbiosTableTest, AnEntryPointNamesTheTable) {
       {"32 bits, the table elsewhere", EntryPoint32(table.size(), 48) + std::string(16, 'x') + table, table},
       {"32 bits, the file ends in the table", EntryPoint32(table.size()) + table.substr(0, 100), table.substr(0, 100)},
       {"32 bits, a table of one byte", EntryPoint32(1) + table, table.substr(0, 1)},
+      {"before 2.1", EntryPointLegacy(table.size()) + table, table},
+      {"before 2.1, the table right behind", EntryPointLegacy(table.size(), 15).substr(0, 15) + table, table},
+      {"before 2.1, the file ends in the table", EntryPointLegacy(table.size()) + table.substr(0, 100), table.substr(0, 100)},
       {"64 bits", EntryPoint64(table.size()) + table, table},
       {"64 bits, the table right behind", EntryPoint64(table.size(), 24).substr(0, 24) + table, table},
       {"64 bits, the largest size there is", EntryPoint64(0xFFFFFFFF) + table, table},
@@ -220,6 +225,10 @@ TEST(SmbiosTableTest, AnEntryPointThatCannotBeRightNamesNothing) {
       {"32 bits: table behind the file", EntryPoint32(table.size(), 32 + table.size() + 1) + table},
       {"32 bits: highest address", EntryPoint32(table.size(), 0xFFFFFFFF) + table},
       {"32 bits: size 0", EntryPoint32(0) + table},
+      {"before 2.1: no table behind", EntryPointLegacy(table.size())},
+      {"before 2.1: table inside the entry point", EntryPointLegacy(table.size(), 14) + table},
+      {"before 2.1: highest address", EntryPointLegacy(table.size(), 0xFFFFFFFF) + table},
+      {"before 2.1: size 0", EntryPointLegacy(0) + table},
       {"64 bits: the anchor alone", "_SM3_"},
       {"64 bits: cut inside", sound64.substr(0, 23)},
       {"64 bits: checksum", with(sound64, 8, 9)},
@@ -264,6 +273,7 @@ TEST(SmbiosTableTest, SeesWhatDmidecodeSees) {
   for (std::string const& name : kRealTables) {
     files.push_back(EntryPoint32(RealTable(name).size()) + RealTable(name));
     files.push_back(EntryPoint64(RealTable(name).size()) + RealTable(name));
+    files.push_back(EntryPointLegacy(RealTable(name).size()) + RealTable(name));
   }
   for (std::string const& file : files) {
     SCOPED_TRACE(file.substr(0, 5));

@@ -22,7 +22,9 @@
 #include <unistd.h>
 #include <boost/make_shared.hpp>
 
+#include <cctype>
 #include <functional>
+#include <set>
 #include <thread>
 
 namespace NQRVZEP20 {
@@ -123,6 +125,43 @@ TEST_F(HostNamespaceTest, TheSampleIsReadWhole) {
   ASSERT_EQ(InstancesOf("CIM_PhysicalMemory").size(), 8u);
   EXPECT_EQ(TextOf(*InstancesOf("CIM_PhysicalMemory")[7], "ElementName"), "CPU 2 DIMM 4");
   EXPECT_EQ(TextOf(*InstancesOf("CIM_PhysicalMemory")[7], "Capacity"), "17179869184");
+}
+
+TEST_F(HostNamespaceTest, TheUuidIsThatOfDmidecodeWhateverTheVersion) {
+  std::string const dmidecode = OutputOfCommand("PATH=$PATH:/usr/sbin:/sbin command -v dmidecode");
+  NEEDS(!dmidecode.empty(), "dmidecode is not installed");
+  std::string const table = TStructureMaker(1, 0x1b)
+                                .Text(0x05, "Server Q100 -[1234AB7]-")
+                                .Bytes(0x08, "\x33\x22\x11\x00\x55\x44\x77\x66\x88\x99\xaa\xbb\xcc\xdd\xee\xff"s)
+                                .Table() +
+                            EndOfTable();
+  std::vector<std::string> entryPoints = {EntryPointLegacy(table.size()), EntryPointLegacy(table.size(), 32, 0x21)};
+  for (int version : {0x200, 0x201, 0x203, 0x204, 0x205, 0x206, 0x207, 0x208, 0x21F, 0x221, 0x233, 0x300})
+    entryPoints.push_back(EntryPoint32(table.size(), 32, 0x1F, version));
+  for (int version : {0x205, 0x300, 0x303, 0x307}) entryPoints.push_back(EntryPoint64(table.size(), 32, 0x18, version));
+
+  std::set<std::string> seen;
+  for (std::string const& entryPoint : entryPoints) {
+    SCOPED_TRACE(testing::PrintToString(entryPoint));
+    Fill(entryPoint + table);
+    std::string uuid = TextOfOnly("QRVSG_ComputerSystem", "UUID");
+    for (char& c : uuid) c = static_cast<char>(std::tolower(c));
+    EXPECT_EQ(uuid + "\n", OutputOfCommand(dmidecode.substr(0, dmidecode.find('\n')) + " --from-dump " + dir_.Path("table") +
+                                           " -s system-uuid 2>/dev/null | tr A-F a-f"));
+    seen.insert(uuid);
+  }
+  EXPECT_THAT(seen, ElementsAre("00112233-4455-6677-8899-aabbccddeeff", "33221100-5544-7766-8899-aabbccddeeff"));
+}
+
+TEST_F(HostNamespaceTest, ABareTablesUuidFollowsTheEntryPointBesideIt) {
+  std::string const table =
+      TStructureMaker(1, 0x1b).Bytes(0x08, "\x33\x22\x11\x00\x55\x44\x77\x66\x88\x99\xaa\xbb\xcc\xdd\xee\xff"s).Table() +
+      EndOfTable();
+  Fill(table);
+  EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "UUID"), "00112233-4455-6677-8899-AABBCCDDEEFF");
+  WriteFile(dir_.Path("smbios_entry_point"), EntryPoint32(table.size(), 0xE0000, 0x1F, 0x204).substr(0, 0x1F));
+  Fill(table);
+  EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "UUID"), "33221100-5544-7766-8899-AABBCCDDEEFF");
 }
 
 TEST_F(HostNamespaceTest, ClassesComeInAFixedOrder) {

@@ -1,0 +1,66 @@
+#include "SmbiosVersion.h"
+
+#include <algorithm>
+#include <filesystem>
+#include <fstream>
+#include <numeric>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+constexpr std::size_t kLongestEntryPoint = 0x20;
+constexpr std::size_t kLegacyLength = 0x0F;
+
+unsigned ByteAt(std::string_view bytes, std::size_t offset) { return static_cast<unsigned char>(bytes[offset]); }
+
+bool StartsWith(std::string_view bytes, std::string_view start) { return bytes.substr(0, start.size()) == start; }
+
+// The bytes of a sound entry point add up to 0.
+bool IsSumZero(std::string_view bytes) {
+  return std::accumulate(bytes.begin(), bytes.end(), 0u,
+                         [](unsigned sum, char byte) { return (sum + static_cast<unsigned char>(byte)) & 0xFFu; }) == 0;
+}
+
+// `least` is what the length byte may say at least.
+bool IsSound(std::string_view bytes, std::size_t lengthOffset, std::size_t least) {
+  if (bytes.size() <= lengthOffset) return false;
+  std::size_t const length = ByteAt(bytes, lengthOffset);
+  return length >= least && length <= kLongestEntryPoint && length <= bytes.size() && IsSumZero(bytes.substr(0, length));
+}
+
+// Some firmware gives versions that there are none of: 2.31 and 2.33 stand for 2.3, 2.51 for 2.6.
+TSmbiosVersion Corrected(TSmbiosVersion version) {
+  if (version == TSmbiosVersion(2, 31) || version == TSmbiosVersion(2, 33)) return {2, 3};
+  if (version == TSmbiosVersion(2, 51)) return {2, 6};
+  return version;
+}
+
+// The start of a file; empty when it cannot be read or is not a regular file, such as a pipe that would keep us waiting.
+std::string StartOf(std::filesystem::path const& path) {
+  std::error_code ignored;
+  if (!std::filesystem::is_regular_file(path, ignored)) return "";
+  std::ifstream file(path, std::ios::binary);
+  std::string start(kLongestEntryPoint, '\0');
+  file.read(start.data(), static_cast<std::streamsize>(start.size()));
+  start.resize(static_cast<std::size_t>(file.gcount()));
+  return start;
+}
+
+}  // namespace
+
+std::optional<TSmbiosVersion> VersionInEntryPoint(std::string_view bytes) {
+  if (StartsWith(bytes, "_SM3_") && IsSound(bytes, 6, 0x18)) return TSmbiosVersion(ByteAt(bytes, 7), ByteAt(bytes, 8));
+  if (StartsWith(bytes, "_SM_") && IsSound(bytes, 5, 0x1E)) return Corrected({ByteAt(bytes, 6), ByteAt(bytes, 7)});
+  bool const isLegacy = StartsWith(bytes, "_DMI_") && bytes.size() >= kLegacyLength && IsSumZero(bytes.substr(0, kLegacyLength));
+  if (isLegacy) return TSmbiosVersion(ByteAt(bytes, 0x0E) >> 4, ByteAt(bytes, 0x0E) & 0x0F);
+  return std::nullopt;
+}
+
+std::optional<TSmbiosVersion> VersionOfTables(std::string const& tableFile) {
+  auto const version = VersionInEntryPoint(StartOf(tableFile));
+  return version ? version
+                 : VersionInEntryPoint(StartOf(std::filesystem::path(tableFile).replace_filename("smbios_entry_point")));
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,94 @@
+#include "providers/host/SmbiosVersion.h"
+
+#include "tests/SmbiosTables.h"
+
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+
+namespace NQRVZEP20 {
+namespace {
+
+std::string VersionText(std::optional<TSmbiosVersion> const& version) {
+  return version ? std::to_string(version->first) + "." + std::to_string(version->second) : "none";
+}
+
+TEST(SmbiosVersionTest, IsThatOfTheEntryPointWhateverItsForm) {
+  struct TRow {
+    std::string entryPoint;
+    char const* version;
+  } const rows[] = {
+      {EntryPoint32(100), "2.8"},
+      {EntryPoint32(100, 32, 0x1F, 0x203), "2.3"},
+      {EntryPoint32(100, 32, 0x1E, 0x205), "2.5"},
+      {EntryPoint32(100, 32, 0x1F, 0x206), "2.6"},
+      {EntryPoint64(100), "3.3"},
+      {EntryPoint64(100, 32, 0x18, 0x305), "3.5"},
+      {EntryPointLegacy(100), "2.0"},
+      {EntryPointLegacy(100, 32, 0x21), "2.1"},
+  };
+  for (TRow const& row : rows) {
+    EXPECT_EQ(VersionText(VersionInEntryPoint(row.entryPoint)), row.version);
+    EXPECT_EQ(VersionText(VersionInEntryPoint(row.entryPoint + "a table")), row.version);
+  }
+}
+
+TEST(SmbiosVersionTest, VersionsThatThereAreNoneOfAreCorrected) {
+  EXPECT_EQ(VersionText(VersionInEntryPoint(EntryPoint32(100, 32, 0x1F, 0x21F))), "2.3");
+  EXPECT_EQ(VersionText(VersionInEntryPoint(EntryPoint32(100, 32, 0x1F, 0x221))), "2.3");
+  EXPECT_EQ(VersionText(VersionInEntryPoint(EntryPoint32(100, 32, 0x1F, 0x233))), "2.6");
+}
+
+TEST(SmbiosVersionTest, ADamagedEntryPointHasNone) {
+  for (std::string const& sound :
+       {EntryPoint32(100).substr(0, 0x1F), EntryPoint64(100).substr(0, 0x18), EntryPointLegacy(100).substr(0, 0x0F)}) {
+    ASSERT_NE(VersionText(VersionInEntryPoint(sound)), "none");
+    for (std::size_t at = 0; at < sound.size(); ++at) {
+      std::string damaged = sound;
+      damaged[at] = static_cast<char>(damaged[at] + 1);
+      EXPECT_EQ(VersionText(VersionInEntryPoint(damaged)), "none") << sound.substr(0, 5) << " " << at;
+      EXPECT_EQ(VersionText(VersionInEntryPoint(sound.substr(0, at))), "none") << sound.substr(0, 5) << " " << at;
+    }
+  }
+  for (int length : {0, 0x17, 0x21, 0xFF}) {
+    std::string const entryPoint = EntryPoint64(100).replace(6, 1, LittleEndian(length, 1)) + std::string(256, '\0');
+    EXPECT_EQ(VersionText(VersionInEntryPoint(WithCheckSum(entryPoint, 5, 0, length))), "none") << length;
+  }
+}
+
+class VersionOfTablesTest : public testing::Test {
+protected:
+  std::string VersionOf(std::string const& table) {
+    WriteFile(dir_.Path("DMI"), table);
+    return VersionText(VersionOfTables(dir_.Path("DMI")));
+  }
+  TTempDir dir_;
+};
+
+TEST_F(VersionOfTablesTest, ADumpBeginsWithIt) {
+  WriteFile(dir_.Path("smbios_entry_point"), EntryPoint64(100));
+  EXPECT_EQ(VersionOf(EntryPoint32(100, 32, 0x1F, 0x204) + RealTable("full")), "2.4") << "not the file beside it";
+}
+
+TEST_F(VersionOfTablesTest, ABareTableHasItBesideIt) {
+  EXPECT_EQ(VersionOf(RealTable("full")), "none");
+  WriteFile(dir_.Path("smbios_entry_point"), EntryPoint32(100, 32, 0x1F, 0x204).substr(0, 0x1F));
+  EXPECT_EQ(VersionOf(RealTable("full")), "2.4");
+  WriteFile(dir_.Path("smbios_entry_point"), EntryPointLegacy(100).substr(0, 0x0F));
+  EXPECT_EQ(VersionOf(RealTable("full")), "2.0");
+  WriteFile(dir_.Path("smbios_entry_point"), "");
+  EXPECT_EQ(VersionOf(RealTable("full")), "none");
+}
+
+TEST_F(VersionOfTablesTest, APipeInItsPlaceIsNotWaitedFor) {
+  ASSERT_EQ(::mkfifo(dir_.Path("smbios_entry_point").c_str(), 0600), 0);
+  EXPECT_EQ(VersionOf(RealTable("full")), "none");
+}
+
+TEST_F(VersionOfTablesTest, TheRealTablesHaveThoseOfTheirMachines) {
+  for (std::string const& name : kRealTables)
+    EXPECT_EQ(VersionText(VersionOfTables(RealTablePath(name))), name == "entry64" ? "3.0" : "2.8") << name;
+  EXPECT_EQ(VersionText(VersionOfTables(SamplePath())), "3.3");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20
