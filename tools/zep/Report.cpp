@@ -10,6 +10,7 @@
 #include "Text.h"
 
 #include <algorithm>
+#include <cctype>
 #include <cstdio>
 #include <cstdlib>
 #include <map>
@@ -30,6 +31,7 @@ constexpr char const* kUnknownModel = "xxx";  // what the helper answers when th
 
 struct TQuestion;
 TAnswer AnswerTo(TQuestion const& question, TNamespaceView const& view);
+TAnswer NotOfTheForm(TAnswer const& raw);
 
 // What one row of the identity asks, and the property that the answer comes from.
 struct TQuestion {
@@ -39,9 +41,18 @@ struct TQuestion {
   char const* fProperty;
   std::string (*fAsk)(TNamespacePtr ns);
   TAnswer (*fAnswer)(TQuestion const& question, TNamespaceView const& view) = AnswerTo;
+  TAnswer (*fWhenRefused)(TAnswer const& raw) = NotOfTheForm;  // of a value that the helper does not take
 };
 
-bool IsBlank(std::string const& text) { return text.find_first_not_of(" \t") == std::string::npos; }
+std::string WithoutOuterBlanks(std::string const& text) {
+  constexpr char const* blanks = " \t";
+  std::size_t const first = text.find_first_not_of(blanks);
+  return first == std::string::npos ? "" : text.substr(first, text.find_last_not_of(blanks) - first + 1);
+}
+
+TAnswer NotOfTheForm(TAnswer const& raw) {
+  return TAnswer::Unknown({kMissingUnexpected, "not in the expected form: \"" + raw.fValue + "\""}, raw.fSource);
+}
 
 // What the helper answers; where it refuses, the reason is looked for in the property itself.
 TAnswer AnswerTo(TQuestion const& question, TNamespaceView const& view) {
@@ -54,28 +65,58 @@ TAnswer AnswerTo(TQuestion const& question, TNamespaceView const& view) {
   if (!raw.fIsKnown) return raw;
   try {
     std::string const text = question.fAsk(view.Get());
-    if (IsBlank(text)) return TAnswer::Unknown({kMissingNotGiven, "the provider gives a blank text"}, raw.fSource);
+    if (WithoutOuterBlanks(text).empty())
+      return TAnswer::Unknown({kMissingNotGiven, "the provider gives a blank text"}, raw.fSource);
     return TAnswer::Known(text, raw.fSource);
   } catch (TZEPException const& failure) {
     EZEPStatusCode const status = failure.GetStatusCode().GetCode();
     if (status != kZEPStatusInvalidFormat && status != kZEPStatusTypeMismatch) throw;
-    return TAnswer::Unknown({kMissingUnexpected, "not in the expected form: \"" + raw.fValue + "\""}, raw.fSource);
+    return question.fWhenRefused(raw);
   }
+}
+
+// "Server Q100 -[1234AB7]-"
+bool HasBrackets(std::string const& productName) {
+  std::size_t const opening = productName.find("-[");
+  return opening != std::string::npos && productName.find(']', opening) != std::string::npos;
+}
+
+// A machine whose product name has no brackets has neither type nor model.
+TAnswer NoTypeAndModel(TAnswer const& productName) {
+  if (HasBrackets(productName.fValue)) return NotOfTheForm(productName);
+  return TAnswer::Unknown({kMissingNotApplicable, "the product name has no machine type and model in \"-[...]-\""},
+                          productName.fSource);
 }
 
 TAnswer AnswerWithModel(TQuestion const& question, TNamespaceView const& view) {
   TAnswer const answer = AnswerTo(question, view);
   if (!answer.fIsKnown || answer.fValue != kUnknownModel) return answer;
-  return TAnswer::Unknown({kMissingNotGiven, "the product name tells the machine type only"}, answer.fSource);
+  bool const isLeftOut = HasBrackets(TCIMSchemaHelper::GetSystemProductName(view.Get()));
+  return TAnswer::Unknown({isLeftOut ? kMissingNotGiven : kMissingNotApplicable, "the product name tells the machine type only"},
+                          answer.fSource);
+}
+
+// The collector's own serial numbers, which TCIMSchemaHelper::GetSerialNumber takes. Makers have others.
+bool IsOfOwnForm(std::string const& serialNumber) {
+  auto const isLetterOrDigit = [](unsigned char c) { return std::isalnum(c) != 0; };
+  return serialNumber.size() == 7 && std::all_of(serialNumber.begin(), serialNumber.end(), isLetterOrDigit);
+}
+
+TAnswer AnswerWithSerialNumber(TQuestion const& question, TNamespaceView const& view) {
+  TAnswer answer = AnswerTo(question, view);
+  if (!answer.fIsKnown) return answer;
+  answer.fValue = WithoutOuterBlanks(answer.fValue);
+  if (!IsOfOwnForm(answer.fValue)) answer.fNote = "not in the collector's own form: 7 letters and digits";
+  return answer;
 }
 
 TQuestion const kIdentity[] = {
     {"hostName", "Host name", kSystem, "Name", TCIMSchemaHelper::GetSystemName},
     {"productName", "Product name", kSystem, "ProductName", TCIMSchemaHelper::GetSystemProductName},
-    {"machineType", "Machine type", kSystem, "ProductName", TCIMSchemaHelper::GetMachineType},
-    {"model", "Model", kSystem, "ProductName", TCIMSchemaHelper::GetModelNumber, AnswerWithModel},
+    {"machineType", "Machine type", kSystem, "ProductName", TCIMSchemaHelper::GetMachineType, AnswerTo, NoTypeAndModel},
+    {"model", "Model", kSystem, "ProductName", TCIMSchemaHelper::GetModelNumber, AnswerWithModel, NoTypeAndModel},
     {"serialNumber", "Serial number", kSystem, "SerialNumber",
-     [](TNamespacePtr ns) { return TCIMSchemaHelper::GetSerialNumber(ns, TCIMContext()); }},
+     [](TNamespacePtr ns) { return TCIMSchemaHelper::GetRawSerialNumberString(ns, TCIMContext()); }, AnswerWithSerialNumber},
     {"osName", "OS", kOperatingSystem, "Name", TCIMSchemaHelper::GetOperatingSystemName},
     {"osVersion", "OS version", kOperatingSystem, "Version", TCIMSchemaHelper::GetOperatingSystemVersion},
     {"osType", "OS type", kOperatingSystem, "OSType", TCIMSchemaHelper::GetOperatingSystemType},
@@ -90,7 +131,8 @@ TMissing WhyNobodyAnswers(std::vector<TPlugIn> const& plugIns) {
   return {kMissingNotDescribed, "no provider plug-in works"};
 }
 
-// The first answer of a provider that knows, else the most telling of the others.
+// The first answer of a provider that knows, else the most telling of the others: that there is no such value, or the first
+// reason.
 template <class TAsk>
 TAnswer AskEveryone(TViews const& views, std::vector<TPlugIn> const& plugIns, TAsk ask) {
   TAnswer best = TAnswer::Unknown(WhyNobodyAnswers(plugIns), "");
@@ -100,7 +142,8 @@ TAnswer AskEveryone(TViews const& views, std::vector<TPlugIn> const& plugIns, TA
     if (!failure.empty())
       answer = TAnswer::Unknown({kMissingProviderFailed, "provider " + view.GetProviderName() + " failed: " + failure}, "");
     if (answer.fIsKnown) return answer;
-    if (best.fMissing.fCode == kMissingNotDescribed) best = answer;
+    bool const tellsMore = best.fMissing.fCode == kMissingNotDescribed || (answer.IsNotApplicable() && !best.IsNotApplicable());
+    if (tellsMore) best = answer;
   }
   return best;
 }
@@ -202,6 +245,13 @@ std::string WithoutTypeAndModel(std::string const& productName) {
   return last == std::string::npos ? productName : name.substr(0, last + 1);
 }
 
+std::string TypeAndModel(std::vector<TReportRow> const& identity) {
+  TAnswer const& type = Row(identity, "machineType");
+  TAnswer const& model = Row(identity, "model");
+  if (type.IsNotApplicable()) return "no machine type and model";
+  return "type " + ValueOr(type, "unknown") + (model.IsNotApplicable() ? ", no model" : ", model " + ValueOr(model, "unknown"));
+}
+
 std::string MachineLine(std::vector<TReportRow> const& identity) {
   TAnswer const& product = Row(identity, "productName");
   TAnswer const& type = Row(identity, "machineType");
@@ -209,9 +259,8 @@ std::string MachineLine(std::vector<TReportRow> const& identity) {
   std::string const host = ValueOr(Row(identity, "hostName"), "Unnamed machine");
   if (!product.fIsKnown && !type.fIsKnown && !serial.fIsKnown && product.fMissing.fReason == serial.fMissing.fReason)
     return host + ": not identified: " + product.fMissing.fReason;
-  return host + ": " + (product.fIsKnown ? WithoutTypeAndModel(product.fValue) : "unknown product") + ", type " +
-         ValueOr(type, "unknown") + ", model " + ValueOr(Row(identity, "model"), "unknown") + ", serial number " +
-         ValueOr(serial, "unknown");
+  return host + ": " + (product.fIsKnown ? WithoutTypeAndModel(product.fValue) : "unknown product") + ", " +
+         TypeAndModel(identity) + ", serial number " + ValueOr(serial, "unknown");
 }
 
 std::string OperatingSystemLine(TReport const& report) {
@@ -232,12 +281,13 @@ std::vector<std::string> HeadLines(TReport const& report) {
 
 EExitStatus StatusOf(TReport const& report) {
   auto const isKnown = [](TReportRow const& row) { return row.fAnswer.fIsKnown; };
-  bool const areAllKnown = std::all_of(report.fIdentity.begin(), report.fIdentity.end(), isKnown);
+  auto const isSettled = [](TReportRow const& row) { return row.fAnswer.fIsKnown || row.fAnswer.IsNotApplicable(); };
+  bool const areAllSettled = std::all_of(report.fIdentity.begin(), report.fIdentity.end(), isSettled);
   bool const isAnyKnown = std::any_of(report.fIdentity.begin(), report.fIdentity.end(), isKnown);
   bool const hasAnyFailed =
       std::any_of(report.fPlugIns.begin(), report.fPlugIns.end(), [](TPlugIn const& plugIn) { return plugIn.HasFailed(); });
   if (!isAnyKnown) return kExitNothing;
-  return areAllKnown && !hasAnyFailed ? kExitComplete : kExitPartial;
+  return areAllSettled && !hasAnyFailed ? kExitComplete : kExitPartial;
 }
 
 }  // namespace

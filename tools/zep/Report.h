@@ -22,8 +22,8 @@ struct TReport {
   std::vector<TReportRow> fDetails;
   std::vector<TPlugIn> fPlugIns;
 
-  // Complete: every row of the identity is known and no plug-in failed. Nothing: no row of the identity is known. The
-  // details do not count.
+  // Complete: every row of the identity is known, or does not apply to this machine, and no plug-in failed. Nothing: no row of
+  // the identity is known. The details do not count.
   EExitStatus fStatus;
 };
 

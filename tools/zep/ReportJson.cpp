@@ -16,6 +16,7 @@ TJson RowsAsJson(std::vector<TReportRow> const& rows) {
     TJson& entry = json[row.fKey] = {{"label", row.fLabel}, {"value", nullptr}, {"source", nullptr}};
     if (answer.fIsKnown) entry["value"] = answer.fValue;
     if (!answer.fSource.empty()) entry["source"] = answer.fSource;
+    if (!answer.fNote.empty()) entry["note"] = answer.fNote;
     if (!answer.fIsKnown) entry["code"] = answer.fMissing.fCode, entry["reason"] = answer.fMissing.fReason;
   }
   return json;

@@ -10,13 +10,17 @@ namespace {
 
 std::string Title(std::string const& title) { return IsSampleSelected() ? std::string(kSampleLabel) + " " + title : title; }
 
+std::string ValueOf(TAnswer const& answer) {
+  if (answer.fIsKnown) return answer.fValue + (answer.fNote.empty() ? "" : " (" + answer.fNote + ")");
+  return (answer.IsNotApplicable() ? "none: " : "unknown: ") + answer.fMissing.fReason;
+}
+
 std::string RowsAsText(std::string const& title, std::vector<TReportRow> const& rows) {
   TTable table({15, 36, 25});
   table.Add({Title(title), "Value", "Source"});
   for (TReportRow const& row : rows) {
     TAnswer const& answer = row.fAnswer;
-    std::string const value = answer.fIsKnown ? answer.fValue : "unknown: " + answer.fMissing.fReason;
-    table.Add({row.fLabel, value, answer.fSource.empty() ? "none" : answer.fSource});
+    table.Add({row.fLabel, ValueOf(answer), answer.fSource.empty() ? "none" : answer.fSource});
   }
   return table.GetText();
 }

@@ -17,6 +17,7 @@ namespace NQRVZEP20::zep {
 constexpr char const* kMissingNotDescribed = "not-described";      // no provider has the class, or an instance of it
 constexpr char const* kMissingNotGiven = "not-given";              // the provider has no value
 constexpr char const* kMissingUnexpected = "unexpected-form";      // there is a value, but none of the expected form
+constexpr char const* kMissingNotApplicable = "not-applicable";    // there is no such value for this machine; nothing is missing
 constexpr char const* kMissingProviderFailed = "provider-failed";  // the provider threw
 
 // Why a value cannot be had.
@@ -31,9 +32,12 @@ struct TAnswer {
   std::string fValue;  // of one that is known
   TMissing fMissing;   // of one that is not
   std::string fSource;
+  std::string fNote;  // what to say beside a value that is known; seldom anything
 
-  static TAnswer Known(std::string value, std::string source) { return {true, std::move(value), {}, std::move(source)}; }
-  static TAnswer Unknown(TMissing why, std::string source) { return {false, "", std::move(why), std::move(source)}; }
+  static TAnswer Known(std::string value, std::string source) { return {true, std::move(value), {}, std::move(source), ""}; }
+  static TAnswer Unknown(TMissing why, std::string source) { return {false, "", std::move(why), std::move(source), ""}; }
+
+  bool IsNotApplicable() const { return !fIsKnown && fMissing.fCode == kMissingNotApplicable; }
 };
 
 // A provider's namespace, as zep reads it. Where a provider tells the source of a value (the property's qualifier
