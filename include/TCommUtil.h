@@ -19,7 +19,8 @@ public:
                         bool keepSeparator);
 
   // Creates every missing directory along the path. Throws what TOSSpecific::CreateDir throws, and leaves the directories
-  // made until then; a plain file in the way is kZEPStatusDirectoryAlreadyExists.
+  // made until then; a plain file in the way is kZEPStatusDirectoryAlreadyExists. A directory that another thread or process
+  // makes at the same time is no failure.
   static void MkDirHier(std::string const& path);
 
   // The first line of a text without the blanks around it, and without what follows its first carriage return (a blank

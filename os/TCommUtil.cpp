@@ -1,6 +1,7 @@
 #include "TCommUtil.h"
 
 #include "TOSSpecific.h"
+#include "TZEPException.h"
 
 #include <algorithm>
 
@@ -9,6 +10,16 @@ namespace {
 
 // Letters, digits, punctuation, blank; tab, newline, vertical tab, form feed, carriage return. Whatever the locale is.
 bool IsText(char c) { return (c >= ' ' && c <= '~') || (c >= '\t' && c <= '\r'); }
+
+// A directory that somebody else makes between the question and the attempt is there, and no failure.
+void MakeDirUnlessThere(std::string const& path) {
+  if (TOSSpecific::DirExists(path)) return;
+  try {
+    TOSSpecific::CreateDir(path);
+  } catch (TZEPException const& failure) {
+    if (failure.GetStatusCode() != kZEPStatusDirectoryAlreadyExists || !TOSSpecific::DirExists(path)) throw;
+  }
+}
 
 }  // namespace
 
@@ -30,7 +41,7 @@ void TCommUtil::MkDirHier(std::string const& path) {
   std::string prefix;
   for (std::string const& part : parts) {
     prefix += part;
-    if (!TOSSpecific::DirExists(prefix)) TOSSpecific::CreateDir(prefix);
+    MakeDirUnlessThere(prefix);
   }
 }
 

@@ -228,6 +228,11 @@ std::vector<TOperation> Operations() {
         {"close", "all", EIO, {"0, text"}},
         {"closedir", "1", EIO, {"0, text"}},
         {"closedir", "2", EIO, {"-1, text"}}}},
+      {"MkDirHier",
+       {"made, there"},
+       {{"stat", "all", ENOENT, {"made, there"}},  // as if another thread made each directory just after it was missed
+        {"mkdir", "1", EEXIST, {"threw kZEPStatusDirectoryAlreadyExists, missing"}},
+        {"mkdir", "1", EACCES, {"threw kZEPStatusAccessDenied, missing"}}}},
       {"ListDir",
        {"file"},
        {{"opendir", "1", EMFILE, {fileError}}, {"readdir", "1", EIO, {""}}, {"closedir", "1", EIO, {"file"}}}},

@@ -3,6 +3,10 @@
 #include "TOSSpecific.h"
 #include "tests/Support.h"
 
+#include <atomic>
+#include <thread>
+#include <vector>
+
 namespace NQRVZEP20 {
 namespace {
 
@@ -91,6 +95,26 @@ TEST_F(MkDirHierTest, StopsAtAFileInTheWay) {
   EXPECT_STATUS(TCommUtil::MkDirHier(fDir.Path("file")), kZEPStatusDirectoryAlreadyExists);
   EXPECT_STATUS(TCommUtil::MkDirHier(fDir.Path("file/")), kZEPStatusDirectoryAlreadyExists);
   EXPECT_STATUS(TCommUtil::MkDirHier(fDir.Path("file/a")), kZEPStatusDirectoryAlreadyExists);
+}
+
+TEST_F(MkDirHierTest, ThreadsThatMakeOneTreeAtOnceAllFindIt) {
+  constexpr int kRounds = 1200, kThreads = 4;
+  std::atomic<int> failures{0}, ready{0};
+  std::vector<std::thread> threads;
+  for (int thread = 0; thread < kThreads; ++thread)
+    threads.emplace_back([&] {
+      for (int round = 1; round <= kRounds; ++round) {
+        ++ready;
+        while (ready < round * kThreads) std::this_thread::yield();  // all at once
+        try {
+          TCommUtil::MkDirHier(fDir.Path(std::to_string(round) + "/a/b/"));
+        } catch (TZEPException const&) {
+          ++failures;
+        }
+      }
+    });
+  for (std::thread& thread : threads) thread.join();
+  EXPECT_EQ(failures, 0);
 }
 
 TEST_F(MkDirHierTest, LeavesWhatItMadeBeforeItStopped) {

@@ -3,6 +3,7 @@
 //
 //   FaultyOperation OPERATION       in a directory of files that the test prepared
 
+#include "TCommUtil.h"
 #include "TConfig.h"
 #include "TOSSpecific.h"
 #include "tests/os/HostTools.h"
@@ -61,6 +62,11 @@ std::string Copy(std::string const& from) {
   return "copied";
 }
 
+std::string MakeTree() {
+  TCommUtil::MkDirHier("tree/below/new");
+  return "made";
+}
+
 std::string OpenStream() {
   std::ofstream stream;
   TOSSpecific::OpenOutputFileStream(stream, "new");
@@ -116,6 +122,7 @@ std::map<std::string, TOperation> const kOperations = {
      {[] { return Copy("large"); }, [] { return ReadFile("copy") == ReadFile("large") ? "all" : "not all"; }}},
     {"DirCopy",
      {[] { return std::to_string(TOSSpecific::DirCopy("tree", "copy", true)); }, [] { return ReadFile("copy/below/file"); }}},
+    {"MkDirHier", {MakeTree, [] { return TOSSpecific::DirExists("tree/below/new/") ? "there" : "missing"; }}},
     {"ListDir", {[] { return Joined(TOSSpecific::ListDir("tree/below")); }}},
     {"FindFile", {[] { return Joined(TOSSpecific::FindFile("tree/below/file")); }}},
     {"deleteFile",
