@@ -90,7 +90,8 @@ public:
   static bool createFile(std::string path, std::string contents);
 
   // Opens the stream on `path`, made or truncated; a stream that is open is closed first. A failure is logged as an error
-  // and throws kZEPStatusAccessDenied for EACCES, else kZEPStatusFileSystemError.
+  // and throws kZEPStatusAccessDenied for EACCES, else kZEPStatusFileSystemError, also where the stream itself is set to
+  // throw; its mask stays as it was, and its state is then failbit.
   static void OpenOutputFileStream(std::ofstream& stream, std::string path);
 
   // The working directory. Throws kZEPStatusFail when there is none or its path is longer than 1023 bytes.

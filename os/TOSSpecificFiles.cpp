@@ -90,6 +90,29 @@ std::vector<std::string> LinesOf(std::string const& text) {
   return lines;
 }
 
+// ---- Streams ----
+
+// Keeps a stream from throwing by itself while it lives. Afterwards the stream throws for what happens then, not for the state
+// that it is left in.
+class TStreamHeldBack {
+public:
+  explicit TStreamHeldBack(std::ios& stream) : fStream(stream), fMask(stream.exceptions()) {
+    fStream.exceptions(std::ios::goodbit);
+  }
+  ~TStreamHeldBack() {
+    try {
+      fStream.exceptions(fMask);
+    } catch (std::ios::failure const&) {  // for that state; the mask is set all the same
+    }
+  }
+  TStreamHeldBack(TStreamHeldBack const&) = delete;
+  TStreamHeldBack& operator=(TStreamHeldBack const&) = delete;
+
+private:
+  std::ios& fStream;
+  std::ios::iostate fMask;
+};
+
 }  // namespace
 
 // The logger itself uses these tests and CreateDir, so they write nothing to the log.
@@ -174,6 +197,7 @@ bool TOSSpecific::createFile(std::string path, std::string contents) {
 
 void TOSSpecific::OpenOutputFileStream(std::ofstream& stream, std::string path) {
   LogDebug("TOSSpecific::OpenOutputFileStream -- Entering ");
+  TStreamHeldBack const heldBack(stream);
   if (stream.is_open()) stream.close();
   stream.clear();
   stream.open(path);

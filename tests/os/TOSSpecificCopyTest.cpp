@@ -553,5 +553,35 @@ TEST_F(FilesTest, StreamThatCannotBeOpenedThrows) {
             "threw kZEPStatusAccessDenied");
 }
 
+TEST_F(FilesTest, StreamThatThrowsByItselfFailsWithTheStatusAndKeepsItsMask) {
+  constexpr std::ios::iostate kMasks[] = {std::ios::failbit, std::ios::badbit, std::ios::failbit | std::ios::badbit,
+                                          std::ios::failbit | std::ios::badbit | std::ios::eofbit};
+  for (std::ios::iostate const mask : kMasks) {
+    SCOPED_TRACE(mask);
+    std::ofstream stream;
+    stream.exceptions(mask);
+    std::string const path = fDir.Path("missing/file");
+    EXPECT_EQ(LogOf([&] { EXPECT_STATUS(TOSSpecific::OpenOutputFileStream(stream, path), kZEPStatusFileSystemError); }),
+              (TEntries{"[Debug] TOSSpecific::OpenOutputFileStream -- Entering ",
+                        "[Error] TOSSpecific::OpenOutputFileStream --  Failed to open output file: " + path}));
+    EXPECT_EQ(stream.exceptions(), mask);
+    EXPECT_EQ(stream.rdstate(), std::ios::failbit);
+
+    TOSSpecific::OpenOutputFileStream(stream, fDir.Path("file"));
+    EXPECT_EQ(stream.exceptions(), mask);
+    EXPECT_TRUE(stream.good());
+  }
+}
+
+TEST_F(FilesTest, StreamThatThrowsByItselfIsClosedFirstWhateverBecomesOfItsOldFile) {
+  std::ofstream stream("/dev/full");
+  stream.exceptions(std::ios::failbit | std::ios::badbit);
+  stream << "never written";  // which closing the file finds out
+  EXPECT_NO_THROW(TOSSpecific::OpenOutputFileStream(stream, fDir.Path("file")));
+  EXPECT_EQ(stream.exceptions(), std::ios::failbit | std::ios::badbit);
+  stream << "new" << std::flush;
+  EXPECT_EQ(ReadFile(fDir.Path("file")), "new");
+}
+
 }  // namespace
 }  // namespace NQRVZEP20
