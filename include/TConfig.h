@@ -16,8 +16,8 @@ namespace NQRVZEP20 {
 //
 // Nothing is stripped: blanks and carriage returns belong to the key or the value. A line whose key or value is empty is
 // passed over, and of two lines with one key the first counts. No operation throws for a missing or malformed file. A
-// missing or empty file is logged as an error. One that cannot be opened, and lines that are no settings, are passed over
-// without a word. Kept.
+// missing or empty file is logged as an error, and so is one that cannot be read to its end, of which no line is used. One
+// that cannot be opened, and lines that are no settings, are passed over silently. Kept.
 //
 // The library uses one TConfig, read on its first use; a file that is made or changed later is not seen. The first
 // GetInstance is expected from one thread, during start-up; from then on any thread may read.

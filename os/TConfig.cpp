@@ -23,7 +23,7 @@ bool HasContents(std::string const& path) {
   }
 }
 
-// Every line, with a newline behind it, up to the end of the file or an error.
+// Every line, with a newline after it, up to the end of the file or to an error, which leaves the stream bad.
 std::string LinesOf(std::istream& file) {
   std::string text;
   for (std::string line; std::getline(file, line);) text.append(line) += '\n';
@@ -113,6 +113,10 @@ void TConfig::parseConfigFile() {
     return;
   }
   std::string const text = LinesOf(file);
+  if (file.bad()) {  // nothing of a part is used
+    LogError("TConfig::parseConfigFile(): Read config file ", fFileName, " failed");
+    return;
+  }
   std::vector<TSetting> settings = SettingsOf(text);
   SortByKey(settings);  // a map takes sorted settings without a search
   for (TSetting const& setting : settings)

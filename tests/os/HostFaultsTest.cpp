@@ -117,6 +117,7 @@ std::vector<TOperation> Operations() {
   std::string const openFailed = "[Error] TOSSpecific::OpenOutputFileStream --  Failed to open output file: new";
   std::string const parsing = "[Debug] TConfig::parseConfigFile(): start to parse config file";
   std::string const missing = "[Error] TConfig::parseConfigFile(): config file doesn't exist";
+  std::string const readingFailed = "[Error] TConfig::parseConfigFile(): Read config file zep.cfg failed";
   std::string const noTransfer = "threw kZEPStatusLibCurlFailure";
   std::string const mapIsEmpty = "[Error] TConfig::getValue(): map is empty";
 
@@ -292,8 +293,19 @@ std::vector<TOperation> Operations() {
        {{"stat", "all", EACCES, {"", parsing, missing, mapIsEmpty}},
         {"fopen64", "1", EACCES, {"", parsing, mapIsEmpty}},
         {"fclose", "1", EIO, {"a,b", parsing}},
-        {"read", "1", EIO, {"", parsing, mapIsEmpty}},
-        {"read", "2", EIO, {"a", parsing}}}},  // the line that it broke off is not counted
+        {"read", "all", EIO, {"", parsing, readingFailed, mapIsEmpty}}}},
+      {"TConfigOfSeveralReads",
+       {"2000", parsing},
+       {{"stat", "all", EACCES, {"0", parsing, missing, mapIsEmpty}},
+        {"fopen64", "1", EACCES, {"0", parsing, mapIsEmpty}},
+        {"fclose", "1", EIO, {"2000", parsing}},
+        {"read", "2", EIO, {"0", parsing, readingFailed, mapIsEmpty}}}},
+      {"TConfigReadAgain",
+       {"a,b", parsing, parsing},
+       {{"stat", "all", EACCES, {"b", parsing, parsing, missing}},
+        {"fopen64", "1", EACCES, {"b", parsing, parsing}},
+        {"fclose", "1", EIO, {"a,b", parsing, parsing}},
+        {"read", "all", EIO, {"b", parsing, parsing, readingFailed}}}},  // what was there stays
   };
 }
 

@@ -78,6 +78,24 @@ std::string Edit() {
   return "done";
 }
 
+void WriteLongConfiguration() {
+  std::string text;
+  for (int i = 0; i < 2000; ++i) text += "key" + std::to_string(i) + "=value\n";
+  WriteFile("zep.cfg", text);
+}
+
+void ReadConfigurationOfB() {
+  std::string const text = ReadFile("zep.cfg");
+  WriteFile("zep.cfg", "b=1");
+  TConfig::GetInstance();
+  WriteFile("zep.cfg", text);
+}
+
+std::string ReadConfigurationAgain() {
+  TConfig::GetInstance()->parseConfigFile();
+  return Joined(TConfig::GetInstance()->listKeys());
+}
+
 std::string KeysWithoutMemory() {
   gLargeAllocationsFail = true;  // that of the stream's buffer
   TConfig* const config = TConfig::GetInstance();
@@ -139,6 +157,9 @@ std::map<std::string, TOperation> const kOperations = {
     {"Upload", {[] { return Transfer("small", false); }, [] { return gCurl.uploaded; }, UseStandInCurl}},
     {"Download", {[] { return Transfer("new", true); }, [] { return ReadFile("new"); }, UseStandInCurl}},
     {"TConfig", {[] { return Joined(TConfig::GetInstance()->listKeys()); }}},
+    {"TConfigOfSeveralReads",
+     {[] { return std::to_string(TConfig::GetInstance()->listKeys().size()); }, [] { return ""; }, WriteLongConfiguration}},
+    {"TConfigReadAgain", {ReadConfigurationAgain, [] { return ""; }, ReadConfigurationOfB}},
     {"TConfigWithoutMemory", {KeysWithoutMemory}},
 };
 
