@@ -164,8 +164,9 @@ public:
   //
   // A child gets its standard output and standard error joined into one pipe, which the caller's thread reads until the
   // last process that holds it closes it. It inherits everything else: standard input, every open descriptor that is not
-  // marked close-on-exec, working directory, signal mask and ignored signals. Its start costs the same however much
-  // memory the caller holds; fork handlers are not run.
+  // marked close-on-exec, working directory, signal mask and ignored signals. The pipes of children that other threads
+  // start are marked so: no child holds up another one's end. Its start costs the same however much memory the caller
+  // holds; fork handlers are not run. Several threads may run children at once; a stack of 32 KiB will do.
   //
   // `timeout` is the longest silence allowed between two chunks of output, in seconds, not a limit on the run; -1 waits
   // for ever. A child that is silent for longer is left alone: neither ended nor waited for.

@@ -72,14 +72,13 @@ struct TPipe {
 // The descriptor, or in its place one above standard error: the child puts its own there and closes the pipe's.
 TUniqueFd AboveStandardError(int fd) {
   TUniqueFd owner(fd);
-  return fd > STDERR_FILENO ? std::move(owner) : TUniqueFd(::fcntl(fd, F_DUPFD, STDERR_FILENO + 1));
+  return fd > STDERR_FILENO ? std::move(owner) : TUniqueFd(::fcntl(fd, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
 }
 
-// Without close-on-exec, so that a child that another thread starts meanwhile inherits both ends, and holds this one's
-// output open as long as it lives. Kept.
+// Closed on exec, so that a child that another thread starts meanwhile does not hold this one's output open as long as it lives.
 TPipe MakePipe() {
   int ends[2];
-  if (::pipe(ends) != 0) return TPipe();
+  if (::pipe2(ends, O_CLOEXEC) != 0) return TPipe();
   return {AboveStandardError(ends[0]), AboveStandardError(ends[1])};
 }
 
@@ -155,6 +154,7 @@ int WaitForOutput(int readEnd, int timeoutSeconds) {
 }
 
 constexpr std::size_t kChunkSize = 4095;
+constexpr std::size_t kPipeSize = 16 * kChunkSize;  // as much as a pipe holds
 
 // Appends each chunk up to its first zero byte; the rest of a chunk behind one is lost. Kept.
 void AppendChunks(std::string_view text, std::string& output) {
@@ -166,7 +166,7 @@ void AppendChunks(std::string_view text, std::string& output) {
 
 // Reads to the end of the output; false, with the reason in the log, when that was not reached.
 bool CollectOutput(int readEnd, std::string const& path, int timeoutSeconds, std::string& output) {
-  char buffer[16 * kChunkSize];  // as much as a pipe holds
+  std::vector<char> buffer(kChunkSize);
   for (;;) {
     int const ready = WaitForOutput(readEnd, timeoutSeconds);
     if (ready == 0) {
@@ -177,10 +177,11 @@ bool CollectOutput(int readEnd, std::string const& path, int timeoutSeconds, std
       LogDebug("ERROR: SpawnProcess - select call failed!");
       return false;
     }
-    ssize_t const got = ::read(readEnd, buffer, sizeof buffer);
+    ssize_t const got = ::read(readEnd, buffer.data(), buffer.size());
     if (got == 0) return true;
-    // A failed read appends nothing and the loop goes on. Kept.
-    if (got > 0) AppendChunks({buffer, static_cast<std::size_t>(got)}, output);
+    if (got < 0) continue;  // nothing is appended, and the loop goes on. Kept.
+    AppendChunks({buffer.data(), static_cast<std::size_t>(got)}, output);
+    if (static_cast<std::size_t>(got) == buffer.size()) buffer.resize(kPipeSize);  // a large output is read in larger pieces
   }
 }
 

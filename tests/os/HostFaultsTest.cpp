@@ -79,7 +79,7 @@ std::vector<TFault> SpawnFaults(TLines const& log, std::string const& good, std:
     return lines;
   };
   return {
-      {"pipe", "1", EMFILE, with(badWithout, {"[Debug] ERROR: SpawnProcess - pipe call failed!"})},
+      {"pipe2", "1", EMFILE, with(badWithout, {"[Debug] ERROR: SpawnProcess - pipe call failed!"})},
       {"vfork", "1", EAGAIN, with("threw kZEPStatusFail", {"[Error] ERROR: Fork failed"})},
       {"close", "all", EINTR, with(good)},
       {"select", "1", EINTR, with(badWithout, {"[Debug] ERROR: SpawnProcess - select call failed!", "a child left"})},
@@ -141,7 +141,7 @@ std::vector<TOperation> Operations() {
                {"select", "1", 0, {"", spawnFind, "[Debug] ERROR: SpawnProcess - find TimeOut!", "a child left"}}}},
       {"CapFileViaProc",
        {"0123456789", spawn, returned},
-       {{"pipe", "1", EMFILE, {"0123456789", spawn, "[Debug] ERROR: SpawnProcess - pipe call failed!", returned}},
+       {{"pipe2", "1", EMFILE, {"0123456789", spawn, "[Debug] ERROR: SpawnProcess - pipe call failed!", returned}},
         {"vfork", "1", EAGAIN, {"", spawn, "[Error] ERROR: Fork failed", captureFailed + "kZEPStatusFail"}},
         {"close", "all", EINTR, {"0123456789", spawn, returned}},
         {"select",

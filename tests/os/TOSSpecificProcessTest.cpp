@@ -10,6 +10,7 @@
 
 #include <atomic>
 #include <chrono>
+#include <functional>
 #include <map>
 
 namespace NQRVZEP20 {
@@ -112,16 +113,38 @@ TEST_F(SpawnProcessTest, ZeroByteCutsOffTheRestOfItsChunk) {
   EXPECT_EQ(RunChild("PrintsZeroByteAmongMany").output, std::string(100 + 4095 + 1810, 'x'));
 }
 
+// While it lives, standard input is a pipe into which nothing but this text comes, and which has no end before End.
+class TTypedInput {
+public:
+  explicit TTypedInput(std::string const& text = "") : fOld(::fcntl(0, F_DUPFD_CLOEXEC, 3)) {
+    int ends[2];
+    if (fOld < 0 || ::pipe2(ends, O_CLOEXEC) != 0) throw std::runtime_error("no pipe");
+    ::dup2(ends[0], 0);
+    ::close(ends[0]);
+    fWriteEnd = ends[1];
+    if (::write(fWriteEnd, text.data(), text.size()) != static_cast<ssize_t>(text.size())) throw std::runtime_error("no room");
+  }
+  ~TTypedInput() {
+    End();
+    ::dup2(fOld, 0);
+    ::close(fOld);
+  }
+  TTypedInput(TTypedInput const&) = delete;
+  TTypedInput& operator=(TTypedInput const&) = delete;
+
+  void End() {
+    if (fWriteEnd >= 0) ::close(fWriteEnd);
+    fWriteEnd = -1;
+  }
+
+private:
+  int fOld, fWriteEnd;
+};
+
 TEST_F(SpawnProcessTest, StandardInputIsTheCallers) {
-  TTempDir const dir;
-  WriteFile(dir.Path("input"), "typed");
-  int const old = ::dup(0), input = ::open(dir.Path("input").c_str(), O_RDONLY);
-  ::dup2(input, 0);
-  TRun const run = RunChild("EchoesItsInput");
-  ::dup2(old, 0);
-  ::close(old);
-  ::close(input);
-  EXPECT_EQ(run.output, "typed");
+  TTypedInput input("typed");
+  input.End();
+  EXPECT_EQ(RunChild("EchoesItsInput").output, "typed");
 }
 
 // ---- What is run ----
@@ -412,15 +435,46 @@ TEST_F(SpawnProcessTest, ChildInheritsTheCallersDescriptorsAndNotItsPipe) {
   EXPECT_NE(descriptors.find(std::to_string(inherited) + " " + dir.Path("inherited") + "\n"), std::string::npos) << descriptors;
 }
 
-TEST_F(SpawnProcessTest, PipeOfAnotherThreadIsInherited) {
+TEST_F(SpawnProcessTest, PipeOfAnotherThreadIsNotInherited) {
   std::string const before = InheritableDescriptors();
+  TTypedInput input;
   int const count = OpenDescriptors();
-  std::thread other([] { RunChild("TalksSlowly", {"4000", "1"}); });
+  std::thread other([] { RunChild("EchoesItsInput"); });
   while (OpenDescriptors() != count + 1) std::this_thread::sleep_for(5ms);  // the read end of its pipe
   std::string const during = InheritableDescriptors(), descriptors = RunChild("PrintsDescriptors").output;
+  input.End();
   other.join();
-  EXPECT_NE(during, before);
-  EXPECT_EQ(descriptors, during);
+  EXPECT_EQ(during, before);
+  EXPECT_EQ(descriptors, before);
+}
+
+// Children that wait for the end of their input start while others run that end at once. One of these would stay silent, and
+// end as timed out, if one of those had its pipe.
+TEST_F(SpawnProcessTest, NoChildWaitsForThatOfAnotherThread) {
+  constexpr int kWaiting = 100, kTimeoutSeconds = 40;
+  TTypedInput input;
+  std::atomic<int> started{0}, wrong{0}, rounds{0};
+  std::vector<std::thread> waiting;
+  std::thread quick([&] {
+    while (started < kWaiting || rounds < kWaiting) {
+      if (RunChild("PrintsNothing", {}, kTimeoutSeconds).result != 0) ++wrong;
+      ++rounds;
+      if (wrong > 0) return;
+    }
+  });
+  for (int i = 0; i < kWaiting; ++i) {
+    waiting.emplace_back([&wrong] {
+      if (RunChild("EchoesItsInput").result != 0) ++wrong;
+    });
+    ++started;
+    std::this_thread::sleep_for(1ms);
+  }
+  quick.join();
+  input.End();
+  for (std::thread& thread : waiting) thread.join();
+  EXPECT_EQ(wrong, 0) << "after " << rounds << " children that end at once";
+  while (::waitpid(-1, nullptr, 0) > 0) {
+  }  // what timed out
 }
 
 TEST_F(SpawnProcessTest, OutputIsCapturedAlsoWhereTheStandardDescriptorsAreClosed) {
@@ -575,6 +629,38 @@ TEST_F(SpawnProcessTest, AFailedExecExitsWith255) {
               return std::to_string(gExitStatus);
             }),
             "255");
+}
+
+// Calls the function on a thread with a stack of that size.
+void OnStackOf(std::size_t size, std::function<void()> function) {
+  pthread_attr_t attributes;
+  ::pthread_attr_init(&attributes);
+  EXPECT_EQ(::pthread_attr_setstacksize(&attributes, size), 0);
+  pthread_t thread;
+  auto const call = [](void* argument) -> void* {
+    (*static_cast<std::function<void()>*>(argument))();
+    return nullptr;
+  };
+  ASSERT_EQ(::pthread_create(&thread, &attributes, call, &function), 0);
+  ::pthread_attr_destroy(&attributes);
+  ::pthread_join(thread, nullptr);
+}
+
+TEST_F(SpawnProcessTest, AStackOf32KiBWillDo) {
+  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs stack of its own";
+  constexpr std::size_t kLength = 1000000;
+  TTempDir const dir;
+  TRun searched, withEnvironment;
+  OnStackOf(32 * 1024, [&] {
+    TLogger::GetInstance()->SetLogFilename(dir.Path("log"));
+    searched = RunChild("PrintsALot", {std::to_string(kLength)});
+    withEnvironment.result = TOSSpecific::SpawnProcess(Child("PrintsALot"), {std::to_string(kLength)}, "zero", {"A=1"},
+                                                       withEnvironment.output, kForEver);
+  });
+  EXPECT_EQ(searched.result, 0);
+  EXPECT_EQ(searched.output.size(), kLength);
+  EXPECT_EQ(withEnvironment.result, 0);
+  EXPECT_TRUE(withEnvironment.output == searched.output);
 }
 
 TEST_F(SpawnProcessTest, ServesManyThreads) {

@@ -12,6 +12,7 @@
 #include <signal.h>
 #include <stdarg.h>
 #include <stdio.h>
+#include <stdio_ext.h>
 #include <stdlib.h>
 #include <string.h>
 #include <sys/mman.h>
@@ -98,7 +99,7 @@ FAILING(DIR*, opendir, (char const* path), (path), nullptr)
 FAILING(struct dirent*, readdir, (DIR * dir), (dir), nullptr)
 FAILING(char*, getcwd, (char* buffer, size_t length), (buffer, length), nullptr)
 FAILING(int, setenv, (char const* name, char const* value, int overwrite), (name, value, overwrite), -1)
-FAILING(int, pipe, (int ends[2]), (ends), -1)
+FAILING(int, pipe2, (int ends[2], int flags), (ends, flags), -1)
 FAILING(int, dup2, (int from, int to), (from, to), -1)
 FAILING(pid_t, waitpid, (pid_t child, int* status, int options), (child, status, options), -1)
 FAILING(int, sigaction, (int number, struct sigaction const* action, struct sigaction* old), (number, action, old), -1)
