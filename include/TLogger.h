@@ -44,15 +44,17 @@ public:
   // Writes the closing banner and closes the file, if one is open.
   ~TLogger() override;
 
-  // Makes the log directory with its parents and opens "<directory><name>.log" through SetLogFilename. Only the first
-  // successful call of an instance does anything; every return is kZEPStatusOK. What TCommUtil::MkDirHier and
-  // SetLogFilename throw passes through, and Initialize can then be called again.
+  // Makes the log directory with its parents (permission bits 0777 less the umask: under the usual one others may list the
+  // names of the log files, under a umask of 0 they may also rename and replace them) and opens "<directory><name>.log"
+  // through SetLogFilename. Only the first successful call of an instance does anything; every return is kZEPStatusOK. What
+  // TCommUtil::MkDirHier and SetLogFilename throw passes through, and Initialize can then be called again.
   TZEPStatusCode Initialize(std::string name);
 
-  // Opens the file and writes the opening banner. An existing file is truncated, unless the environment variable
-  // QRV_YBNQI_GUI_T is set (to anything), which appends. Throws kZEPStatusAccessDenied for EACCES and
-  // kZEPStatusFileSystemError for any other failure; the name stays set then, and nothing is written until a later call
-  // succeeds. A stream opened by an earlier call stays open, unused.
+  // Opens the file and writes the opening banner. A file that is made here has the permission bits 0600, whatever the
+  // umask: entries at debug severity may hold passwords and the contents of files. An existing file keeps its bits and its
+  // owner, and is truncated, unless the environment variable QRV_YBNQI_GUI_T is set (to anything), which appends. Throws
+  // kZEPStatusAccessDenied for EACCES and kZEPStatusFileSystemError for any other failure; the name stays set then, and nothing
+  // is written until a later call succeeds. A stream opened by an earlier call stays open, unused.
   void SetLogFilename(std::string path) override;
 
   // ---- Writing ----

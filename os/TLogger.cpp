@@ -3,9 +3,12 @@
 #include "TCommUtil.h"
 #include "TOSSpecific.h"
 #include "TZEPException.h"
+#include "core/Handles.h"
 #include "os/LocalTime.h"
 
+#include <fcntl.h>
 #include <pthread.h>
+#include <sys/stat.h>
 #include <boost/thread/exceptions.hpp>
 #include <boost/thread/lock_guard.hpp>
 
@@ -136,6 +139,24 @@ void Record(ILogger::EZEPLogSeverity severity, std::string const& message) {
   TLogger::PushBackLog(entry);
 }
 
+constexpr mode_t kOwnerOnly = S_IRUSR | S_IWUSR;
+
+// A file that is made here is for its owner alone, whatever the umask is: entries at debug severity may hold passwords.
+TUniqueFd OpenLogFile(std::string const& path, int flags) {
+  TUniqueFd made(::open(path.c_str(), flags | O_CREAT | O_EXCL, kOwnerOnly));
+  if (!made && errno == EEXIST) return TUniqueFd(::open(path.c_str(), flags | O_CREAT, kOwnerOnly));
+  if (made) ::fchmod(made.get(), kOwnerOnly);  // a file system without such modes refuses, and the log is written all the same
+  return made;
+}
+
+// As std::fopen, with that mode for a new file: null, with the reason in errno, for a failure.
+std::FILE* OpenLogStream(std::string const& path, bool isAppended) {
+  TUniqueFd file = OpenLogFile(path, O_RDWR | (isAppended ? O_APPEND : O_TRUNC));
+  std::FILE* const stream = file ? ::fdopen(file.get(), isAppended ? "a+" : "w+") : nullptr;
+  if (stream != nullptr) file.release();
+  return stream;
+}
+
 void WriteFlushed(std::FILE* file, char const* text) {
   std::fputs(text, file);
   std::fflush(file);
@@ -192,7 +213,7 @@ TZEPStatusCode TLogger::Initialize(std::string name) {
 void TLogger::SetLogFilename(std::string path) {
   fLogFilename = path;
   // The stream of an earlier call is not closed: it stays open, unused. Kept.
-  fLogFile = std::fopen(path.c_str(), std::getenv("QRV_YBNQI_GUI_T") ? "a+" : "w+");
+  fLogFile = OpenLogStream(path, std::getenv("QRV_YBNQI_GUI_T") != nullptr);
   if (fLogFile == nullptr) throw TZEPException(errno == EACCES ? kZEPStatusAccessDenied : kZEPStatusFileSystemError);
   WriteFlushed(fLogFile, "-- ZEP Log Opened ----------------------------\n");
 }

@@ -10,6 +10,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <pthread.h>
+#include <sys/stat.h>
 
 #include <chrono>
 #include <climits>
@@ -239,6 +240,52 @@ TEST_F(TLoggerTest, AppendingMakesAMissingFile) {
   TEnvironmentGuard const appending("QRV_YBNQI_GUI_T", "1");
   { TLogger().SetLogFilename(Path("new.log")); }
   EXPECT_EQ(ReadFile(Path("new.log")), kOpenBanner + kCloseBanner);
+}
+
+mode_t ModeOf(std::string const& path) {
+  struct stat status {};
+  EXPECT_EQ(::stat(path.c_str(), &status), 0);
+  return status.st_mode & 07777;
+}
+
+TEST_F(TLoggerTest, AFileThatItMakesIsForItsOwnerAloneWhateverTheUmask) {
+  for (char const* appending : {static_cast<char const*>(nullptr), "1"})
+    for (mode_t const mask : {0, 022, 077, 0277, 0777}) {
+      SCOPED_TRACE(mask);
+      TEnvironmentGuard const setting("QRV_YBNQI_GUI_T", appending);
+      std::string const path = Path(std::to_string(mask) + (appending ? "appending.log" : ".log"));
+      mode_t const old = ::umask(mask);
+      { TLogger().SetLogFilename(path); }
+      ::umask(old);
+      EXPECT_EQ(ModeOf(path), mode_t{0600});
+      EXPECT_EQ(ReadFile(path), kOpenBanner + kCloseBanner);
+    }
+}
+
+TEST_F(TLoggerTest, AFileThatInitializeMakesIsForItsOwnerAlone) {
+  TLogger::SetLogFileDir(Path("logs/"));
+  mode_t const old = ::umask(022);
+  { TLogger().Initialize("zep"); }
+  ::umask(old);
+  EXPECT_EQ(ModeOf(Path("logs")), mode_t{0755});
+  EXPECT_EQ(ModeOf(Path("logs/zep.log")), mode_t{0600});
+}
+
+TEST_F(TLoggerTest, AFileThatIsThereKeepsItsMode) {
+  for (char const* appending : {static_cast<char const*>(nullptr), "1"}) {
+    TEnvironmentGuard const setting("QRV_YBNQI_GUI_T", appending);
+    WriteFile(Path("a.log"), "");
+    std::filesystem::permissions(Path("a.log"), std::filesystem::perms(0640));
+    { TLogger().SetLogFilename(Path("a.log")); }
+    EXPECT_EQ(ModeOf(Path("a.log")), mode_t{0640});
+  }
+}
+
+TEST_F(TLoggerTest, AFileThatItMakesThroughALinkIsForItsOwnerAlone) {
+  std::filesystem::create_symlink("target.log", Path("link.log"));
+  { TLogger().SetLogFilename(Path("link.log")); }
+  EXPECT_EQ(ModeOf(Path("target.log")), mode_t{0600});
+  EXPECT_EQ(ReadFile(Path("target.log")), kOpenBanner + kCloseBanner);
 }
 
 TEST_F(TLoggerTest, LooksAtTheEnvironmentAtEachOpening) {
