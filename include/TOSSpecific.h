@@ -326,8 +326,10 @@ public:
   // without a transfer and without an error. An empty download leaves no file. What arrived of a broken one stays.
   //
   // Every failure is logged as an error. Throws kZEPStatusLibCurlFailure when libcurl cannot be had or set up, or the file to
-  // be uploaded cannot be read; kZEPStatusConnectionFailed when the host is unknown or nobody answers there;
-  // kZEPStatusAccessDenied for any other failure of the transfer, a full local disk included.
+  // be uploaded cannot be opened; kZEPStatusConnectionFailed when the host is unknown or nobody answers there;
+  // kZEPStatusAccessDenied for any other failure of the transfer, a full local disk included, and when the file to be uploaded
+  // cannot be read to its end (a directory, a failing disk): what was read until then stays on the server, as it does when an
+  // upload breaks off.
   static void CurlTransferFile(std::string url, std::string localFile, bool download);
 
   // Uploads to ftp://host/name or sftp://host/name; when the environment variable ZEP_ISBOOTABLE is "yes", below

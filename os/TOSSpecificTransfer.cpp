@@ -108,6 +108,13 @@ void Download(TCurl& curl, std::string const& url, std::string const& localFile)
   PerformTransfer(curl);
 }
 
+// libcurl takes a read that fails for the end of the file: what arrived is cut off there.
+void CheckWasReadToItsEnd(std::FILE* stream) {
+  if (std::ferror(stream) == 0) return;
+  LogError("TOSSpecific|CurlTransferFile: Error performing command: the local file cannot be read to its end");
+  throw TZEPException(kZEPStatusAccessDenied);
+}
+
 void Upload(TCurl& curl, std::string const& url, TUniqueFile& stream, std::string const& localFile) {
   stream = OpenForUpload(localFile);
   curl.Set(CURLOPT_UPLOAD, 1L, "TOSSpecific|CurlTransferFile: Error setting curl upload");
@@ -115,6 +122,7 @@ void Upload(TCurl& curl, std::string const& url, TUniqueFile& stream, std::strin
   curl.Set(CURLOPT_READDATA, stream.get(), "TOSSpecific|CurlTransferFile: Error setting curl upload file");
   CreateMissingDirectories(curl);
   PerformTransfer(curl);
+  CheckWasReadToItsEnd(stream.get());
 }
 
 // Where an upload goes on the server: on bootable media always into the directory that the maker's server has for them.

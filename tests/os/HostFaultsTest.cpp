@@ -119,6 +119,8 @@ std::vector<TOperation> Operations() {
   std::string const missing = "[Error] TConfig::parseConfigFile(): config file doesn't exist";
   std::string const readingFailed = "[Error] TConfig::parseConfigFile(): Read config file zep.cfg failed";
   std::string const noTransfer = "threw kZEPStatusLibCurlFailure";
+  std::string const uploadFailed =
+      "[Error] TOSSpecific|CurlTransferFile: Error performing command: the local file cannot be read to its end";
   std::string const mapIsEmpty = "[Error] TConfig::getValue(): map is empty";
 
   return {
@@ -268,7 +270,17 @@ std::vector<TOperation> Operations() {
         {"fstat", "1", EIO, {noTransfer, "[Error] TOSSpecific|CurlTransferFile: Error getting file size"}},
         {"close", "all", EIO, {"transferred, 0123456789"}},
         {"fopen", "1", EMFILE, {noTransfer, "[Error] TOSSpecific|CurlTransferFile: Error creating file stream"}},
+        {"fread", "1", EBADF, {"threw kZEPStatusAccessDenied", uploadFailed}},
         {"fclose", "1", EIO, {"transferred, 0123456789"}}}},
+      {"UploadOfSeveralReads",
+       {"transferred, 2000000 bytes"},
+       {{"open", "1", EACCES, {noTransfer + ", 0 bytes", "[Error] TOSSpecific|CurlTransferFile: Error getting file size"}},
+        {"fstat", "1", EIO, {noTransfer + ", 0 bytes", "[Error] TOSSpecific|CurlTransferFile: Error getting file size"}},
+        {"close", "all", EIO, {"transferred, 2000000 bytes"}},
+        {"fopen", "1", EMFILE, {noTransfer + ", 0 bytes", "[Error] TOSSpecific|CurlTransferFile: Error creating file stream"}},
+        {"fclose", "1", EIO, {"transferred, 2000000 bytes"}},
+        {"fread", "1", EBADF, {"threw kZEPStatusAccessDenied, 0 bytes", uploadFailed}},
+        {"fread", "1001", EBADF, {"threw kZEPStatusAccessDenied, 1000000 bytes", uploadFailed}}}},
       {"Download",
        {"transferred, first second"},
        {{"fopen", "1", EACCES, {"transferred, first second"}},  // whether the file is there

@@ -174,6 +174,30 @@ TEST_F(TransferTest, AFileThatCannotBeReadEndsAnUploadAfterTheCommonOptions) {
   EXPECT_THAT(record_.calls, ElementsAreArray(Joined(kStart, {}, kEnd)));
 }
 
+TEST_F(TransferTest, AnUploadOfWhatCannotBeReadToItsEndIsAccessDenied) {
+  for (std::string const& file : {dir_.Path(), std::string("/proc/self/mem")}) {  // both open; the second one fails with EIO
+    SCOPED_TRACE(file);
+    TCurlRecord record;
+    TLines log;
+    WithStandIn(record, [&] {
+      log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file, false), kZEPStatusAccessDenied); });
+    });
+    EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error performing command: "
+                                 "the local file cannot be read to its end"));
+    EXPECT_EQ(TLines(record.calls.end() - 3, record.calls.end()), Joined({"perform"}, kEnd, {}));
+  }
+}
+
+TEST_F(TransferTest, AFailedPerformSaysItsOwnReasonAlsoWhereTheFileCannotBeRead) {
+  record_.result = 67;
+  record_.errorText = "Access denied: 530";
+  TLines log;
+  WithStandIn(record_, [&] {
+    log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", dir_.Path(), false), kZEPStatusAccessDenied); });
+  });
+  EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error performing command: Access denied: 530"));
+}
+
 TEST_F(TransferTest, WhatPerformGivesBecomesAStatus) {
   struct TRow {
     int result;

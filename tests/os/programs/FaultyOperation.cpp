@@ -155,6 +155,8 @@ std::map<std::string, TOperation> const kOperations = {
     {"USleep", {[] { return std::to_string(TOSSpecific::USleep(1)); }}},
     {"LaunchCommandShell", {[] { return std::to_string(TOSSpecific::LaunchCommandShell()); }}},
     {"Upload", {[] { return Transfer("small", false); }, [] { return gCurl.uploaded; }, UseStandInCurl}},
+    {"UploadOfSeveralReads",
+     {[] { return Transfer("large", false); }, [] { return std::to_string(gCurl.uploaded.size()) + " bytes"; }, UseStandInCurl}},
     {"Download", {[] { return Transfer("new", true); }, [] { return ReadFile("new"); }, UseStandInCurl}},
     {"TConfig", {[] { return Joined(TConfig::GetInstance()->listKeys()); }}},
     {"TConfigOfSeveralReads",
