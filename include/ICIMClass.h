@@ -11,7 +11,8 @@ class ICIMProperty;
 class ICIMPropertyDecl;
 
 // A CIM class: its name, superclass, qualifiers, property and method declarations, and its instances. Some operations have a
-// body, so that a plug-in may leave them out; where nothing else is said, it throws kZEPStatusNotImplemented.
+// body, so that a plug-in may leave them out; where nothing else is said, it throws kZEPStatusNotImplemented. The destination of
+// a copy needs them; see ICIMElement.h.
 class ZEP_EXPORT ICIMClass : public ICIMNamedElement {
 public:
   ~ICIMClass() override;

@@ -25,8 +25,19 @@ namespace NQRVZEP20 {
 // - Failure is a thrown TZEPException. A class or property declaration that is not there is kZEPStatusNotFound; anything
 //   else that is not there (a qualifier declaration, a qualifier, a property, an instance) comes back as an empty pointer,
 //   which the caller tests before use.
-// - An operation that the library does not need has a body, so that a plug-in need not write one. It throws
-//   kZEPStatusNotImplemented, unless its comment says otherwise. The tool zep and the memory namespace use these, too.
+// - An operation that only some uses need has a body, so that a plug-in which is not used in that way need not write it.
+//   Unless its comment says otherwise, the body logs one error that names the plug-in's class and the operation, and throws
+//   kZEPStatusNotImplemented. Which of them a use needs:
+//
+//     a copy's source (TCIMCopy)    GetDeclaration of a property, when a class has static properties; GetClass of an instance
+//                                   and GetName of a property, when instances are copied
+//     a copy's destination          CreateQualifierDecl, AddQualifier, SetStaticProperty and AddMethodDecl, when the source
+//                                   has such; CommitInstance, when instances are copied
+//     queries (TCIMSchemaHelper)    none
+//     references (TCIMReference)    none
+//     the tool zep                  GetName of a namespace, GetPath, GetName and GetDeclaration of a property, IsKey
+//
+//   docs/writing-a-provider.md has the whole table, of the operations without a body too.
 // - Names are compared without regard to case, as CIM names are, and keep the spelling they were made with. What is
 //   created or declared under a name that is no CIM name throws kZEPStatusInvalidCIMName.
 // - Nothing is promised about threads: one namespace is used from one thread at a time.

@@ -13,7 +13,8 @@ class ZEP_EXPORT ICIMInstance : public ICIMElement {
 public:
   ~ICIMInstance() override;
 
-  // The class that the instance was created in. Has a body, which throws kZEPStatusNotImplemented, as that of GetPath does.
+  // The class that the instance was created in. Has a body, which throws kZEPStatusNotImplemented, as that of GetPath does:
+  // copying an instance needs it.
   virtual boost::shared_ptr<ICIMClass> GetClass(TCIMContext const& context) const;
 
   // Empty when the class has no such property.

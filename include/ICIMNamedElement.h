@@ -25,7 +25,8 @@ public:
   // Writes a qualifier on this element. `declaration` is one of this element's own namespace (kZEPStatusNotFound, as for an
   // empty one); the value must be of the declared type (kZEPStatusTypeMismatch). Throws kZEPStatusAlreadyExists when the element
   // has it, kZEPStatusInvalidOpSequence for Key on a property of a class that has made instances. Whether the qualifier may
-  // stand on this kind of element is not checked. Has a body, which throws kZEPStatusNotImplemented.
+  // stand on this kind of element is not checked. Has a body, which throws kZEPStatusNotImplemented: the
+  // destination of a copy needs it.
   virtual boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                         unsigned int flavor, TCIMContext const& context);
 };

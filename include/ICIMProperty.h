@@ -17,7 +17,8 @@ public:
   // kZEPStatusInvalidOpSequence for a key of an instance that was committed.
   virtual void SetValue(TCIMValue const& value, TCIMContext const& context) = 0;
 
-  // Both have a body, which throws kZEPStatusNotImplemented.
+  // Both have a body, which throws kZEPStatusNotImplemented: copying an instance needs the first, copying a static property
+  // the second.
   virtual std::string GetName(TCIMContext const& context) const;  // spelled as declared
   virtual boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(TCIMContext const& context) const;
 };

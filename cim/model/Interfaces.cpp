@@ -17,6 +17,11 @@
 #include "INamespaceProviderManager.h"
 #include "TCIMReference.h"
 #include "TZEPException.h"
+#include "core/Log.h"
+
+#include <boost/core/demangle.hpp>
+
+#include <typeinfo>
 
 namespace NQRVZEP20 {
 
@@ -37,40 +42,52 @@ INamespaceProviderManager::~INamespaceProviderManager() = default;
 
 // ---- What a plug-in may leave out ----
 
-std::string ICIMNamespace::GetName(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
+namespace {
+
+// `implementer`: the class of the plug-in's object. `operation`: "ICIMClass::CommitInstance".
+[[noreturn]] void ThrowNotImplemented(std::type_info const& implementer, char const* operation) {
+  LogError(boost::core::demangle(implementer.name()), " does not implement ", operation);
+  throw TZEPException(kZEPStatusNotImplemented);
+}
+
+}  // namespace
+
+std::string ICIMNamespace::GetName(TCIMContext const&) const { ThrowNotImplemented(typeid(*this), "ICIMNamespace::GetName"); }
 
 boost::shared_ptr<ICIMQualifierDecl> ICIMNamespace::CreateQualifierDecl(std::string const&, TCIMValue const&, unsigned int,
                                                                         unsigned int, TCIMContext const&) {
-  throw TZEPException(kZEPStatusNotImplemented);
+  ThrowNotImplemented(typeid(*this), "ICIMNamespace::CreateQualifierDecl");
 }
 
 boost::shared_ptr<ICIMQualifier> ICIMNamedElement::AddQualifier(boost::shared_ptr<ICIMQualifierDecl>, TCIMValue const&,
                                                                 unsigned int, TCIMContext const&) {
-  throw TZEPException(kZEPStatusNotImplemented);
+  ThrowNotImplemented(typeid(*this), "ICIMNamedElement::AddQualifier");
 }
 
 bool ICIMClass::IsAbstract(TCIMContext const&) const { return false; }
 void ICIMClass::SetStaticProperty(std::string const&, TCIMValue const&, TCIMContext const&) {
-  throw TZEPException(kZEPStatusNotImplemented);
+  ThrowNotImplemented(typeid(*this), "ICIMClass::SetStaticProperty");
 }
 boost::shared_ptr<ICIMMethodDecl> ICIMClass::AddMethodDecl(std::string const&, TCIMValue::TCIMType, TCIMContext const&) {
-  throw TZEPException(kZEPStatusNotImplemented);
+  ThrowNotImplemented(typeid(*this), "ICIMClass::AddMethodDecl");
 }
 void ICIMClass::CommitInstance(boost::shared_ptr<ICIMInstance>, TCIMContext const&) {
-  throw TZEPException(kZEPStatusNotImplemented);
+  ThrowNotImplemented(typeid(*this), "ICIMClass::CommitInstance");
 }
 void ICIMClass::BeginDeclarations(TCIMContext const&) {}
 void ICIMClass::EndDeclarations(TCIMContext const&) {}
 
-boost::shared_ptr<ICIMClass> ICIMInstance::GetClass(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
-TCIMReference ICIMInstance::GetPath(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
+boost::shared_ptr<ICIMClass> ICIMInstance::GetClass(TCIMContext const&) const {
+  ThrowNotImplemented(typeid(*this), "ICIMInstance::GetClass");
+}
+TCIMReference ICIMInstance::GetPath(TCIMContext const&) const { ThrowNotImplemented(typeid(*this), "ICIMInstance::GetPath"); }
 
-std::string ICIMProperty::GetName(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
+std::string ICIMProperty::GetName(TCIMContext const&) const { ThrowNotImplemented(typeid(*this), "ICIMProperty::GetName"); }
 boost::shared_ptr<ICIMPropertyDecl const> ICIMProperty::GetDeclaration(TCIMContext const&) const {
-  throw TZEPException(kZEPStatusNotImplemented);
+  ThrowNotImplemented(typeid(*this), "ICIMProperty::GetDeclaration");
 }
 
-bool ICIMPropertyDecl::IsKey(TCIMContext const&) const { throw TZEPException(kZEPStatusNotImplemented); }
+bool ICIMPropertyDecl::IsKey(TCIMContext const&) const { ThrowNotImplemented(typeid(*this), "ICIMPropertyDecl::IsKey"); }
 boost::weak_ptr<ICIMNamedElement> ICIMPropertyDecl::GetOwner(TCIMContext const&) const { return {}; }
 
 boost::weak_ptr<ICIMNamedElement> ICIMMethodDecl::GetOwner(TCIMContext const&) const { return {}; }
@@ -78,7 +95,7 @@ boost::weak_ptr<ICIMNamedElement> ICIMMethodDecl::GetOwner(TCIMContext const&) c
 boost::weak_ptr<ICIMMethodDecl> ICIMParameterDecl::GetMethod(TCIMContext const&) const { return {}; }
 
 boost::shared_ptr<ICIMQualifierDecl> ICIMQualifier::GetDeclaration(TCIMContext const&) const {
-  throw TZEPException(kZEPStatusNotImplemented);
+  ThrowNotImplemented(typeid(*this), "ICIMQualifier::GetDeclaration");
 }
 boost::weak_ptr<ICIMNamedElement> ICIMQualifier::GetOwner(TCIMContext const&) const { return {}; }
 

@@ -658,6 +658,7 @@ TEST_F(MofFileTest, AReadErrorInAnIncludedFileNamesTheDirective) {
 TEST_F(MofFileTest, AFileThatTellsNoSizeIsReadAllTheSame) {
   EXPECT_EQ(StatusOf([] { ReadMofFile("/proc/self/mem", NewNamespace()); }), kZEPStatusFileSystemError);
   EXPECT_EQ(StatusOf([] { ReadMofFile("/proc/self/status", NewNamespace()); }), kZEPStatusInvalidFormat);
+  EXPECT_EQ(StatusOf([] { ReadMofFile("/proc/sys/kernel/ostype", NewNamespace()); }), kZEPStatusInvalidFormat);
 }
 
 TEST_F(MofFileTest, AnEmptyFileDeclaresNothing) {
