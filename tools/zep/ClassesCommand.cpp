@@ -13,6 +13,7 @@
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
 #include <iostream>
 #include <memory>
 
@@ -73,10 +74,27 @@ std::string AsText(std::vector<TNamespaceClasses> const& namespaces, bool asTree
   return text;
 }
 
-std::string AsJson(std::vector<TNamespaceClasses> const& namespaces) {
-  TJson document = DocumentHead("zep classes");
+struct TClasses {
+  std::vector<TNamespaceClasses> fNamespaces;
+  std::vector<std::string> fFailures;  // of the providers
+
+  bool IsEmpty() const {
+    return std::all_of(fNamespaces.begin(), fNamespaces.end(), [](TNamespaceClasses const& ns) { return ns.fClasses.empty(); });
+  }
+  EExitStatus ExitStatus() const { return IsEmpty() ? kExitNothing : fFailures.empty() ? kExitComplete : kExitPartial; }
+
+  // Why not everything is shown, a reason each.
+  std::vector<std::string> Reasons() const {
+    std::vector<std::string> reasons = fFailures;
+    if (IsEmpty()) reasons.push_back("there is no class");
+    return reasons;
+  }
+};
+
+std::string AsJson(TClasses const& found) {
+  TJson document = DocumentHead("zep classes", found.ExitStatus(), Joined(found.Reasons(), "; "));
   document["namespaces"] = TJson::array();
-  for (TNamespaceClasses const& ns : namespaces) {
+  for (TNamespaceClasses const& ns : found.fNamespaces) {
     TJson classes = TJson::array();
     for (TClassEntry const& entry : ns.fClasses)
       classes.push_back({{"name", entry.fName},
@@ -90,34 +108,26 @@ std::string AsJson(std::vector<TNamespaceClasses> const& namespaces) {
   return zep::AsText(document);
 }
 
-struct TClasses {
-  std::vector<TNamespaceClasses> fNamespaces;
-  std::string fFailures;  // a line for each provider that failed
-};
-
 TClasses FindClasses(TArguments const& arguments) {
   TClasses classes;
   bool const isMof = !arguments.fMofFile.empty();
   std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugIns();
-  classes.fFailures = FailuresAsText(plugIns);
+  classes.fFailures = FailuresOf(plugIns);
   for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
     std::string const failure = FailureOf([&] {
       classes.fNamespaces.push_back({view.GetProviderName(), view.GetName(), ClassesOf(*view.Get())});
     });
-    if (!failure.empty()) classes.fFailures += Printable("zep: " + view.GetProviderName() + ": " + failure) + "\n";
+    if (!failure.empty()) classes.fFailures.push_back(view.GetProviderName() + ": " + failure);
   }
   return classes;
 }
 
 int Classes(TArguments const& arguments) {
   if (arguments.fSample) SelectSample();
-  TClasses const classes = OrFailureDocument("zep classes", arguments.fAsJson, [&] { return FindClasses(arguments); });
-  bool isAny = false;
-  for (TNamespaceClasses const& ns : classes.fNamespaces) isAny = isAny || !ns.fClasses.empty();
-  std::cerr << classes.fFailures;
-  WriteOutput(arguments.fAsJson ? AsJson(classes.fNamespaces) : AsText(classes.fNamespaces, arguments.fAsTree));
-  if (!isAny) std::cerr << "zep: there is no class\n";
-  return !isAny ? kExitNothing : !classes.fFailures.empty() ? kExitPartial : kExitComplete;
+  TClasses const classes = FindClasses(arguments);
+  WriteOutput(arguments.fAsJson ? AsJson(classes) : AsText(classes.fNamespaces, arguments.fAsTree));
+  for (std::string const& reason : classes.Reasons()) std::cerr << "zep: " << Printable(reason) << "\n";
+  return classes.ExitStatus();
 }
 
 }  // namespace

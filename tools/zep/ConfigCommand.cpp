@@ -113,8 +113,8 @@ std::string AsText(TSettings const& settings) {
   return text;
 }
 
-std::string AsJson(TSettings const& settings) {
-  TJson document = DocumentHead("zep config");
+std::string AsJson(TSettings const& settings, EExitStatus status, std::string const& reason) {
+  TJson document = DocumentHead("zep config", status, reason);
   document["file"] = settings.fPath;
   document["settings"] = TJson::array();
   for (TSetting const& setting : settings.fSettings)
@@ -126,23 +126,25 @@ std::string AsJson(TSettings const& settings) {
   return zep::AsText(document);
 }
 
-// Why there is no setting at all, or none of that key.
+// Why there is no setting at all, or none of that key; empty when there is one.
 std::string WhyNothing(TArguments const& arguments, TSettings const& settings) {
-  if (!TOSSpecific::FileExists(kFileName)) return "there is no " + Printable(settings.fPath);
-  if (TOSSpecific::GetFileSize(kFileName) == 0) return Printable(settings.fPath) + " is empty";
-  if (!std::ifstream(kFileName)) return Printable(settings.fPath) + " cannot be read";
-  if (!arguments.fKey) return "no line of " + Printable(settings.fPath) + " is a setting";
-  return Printable(settings.fPath) + " does not set \"" + Printable(*arguments.fKey) + "\"";
+  if (!settings.fSettings.empty()) return "";
+  if (!TOSSpecific::FileExists(kFileName)) return "there is no " + settings.fPath;
+  if (TOSSpecific::GetFileSize(kFileName) == 0) return settings.fPath + " is empty";
+  if (!std::ifstream(kFileName)) return settings.fPath + " cannot be read";
+  if (!arguments.fKey) return "no line of " + settings.fPath + " is a setting";
+  return settings.fPath + " does not set \"" + *arguments.fKey + "\"";
 }
 
 int Config(TArguments const& arguments) {
   TSettings settings = ReadSettings();
   if (arguments.fKey) KeepOnly(*arguments.fKey, settings);
   bool const isAnything = !settings.fSettings.empty() || !settings.fIgnored.empty();
-  if (isAnything || arguments.fAsJson) WriteOutput(arguments.fAsJson ? AsJson(settings) : AsText(settings));
-  if (!settings.fSettings.empty()) return kExitComplete;
-  std::cerr << "zep: " << WhyNothing(arguments, settings) << "\n";
-  return kExitNothing;
+  std::string const why = WhyNothing(arguments, settings);
+  EExitStatus const status = why.empty() ? kExitComplete : kExitNothing;
+  if (isAnything || arguments.fAsJson) WriteOutput(arguments.fAsJson ? AsJson(settings, status, why) : AsText(settings));
+  if (!why.empty()) std::cerr << "zep: " << Printable(why) << "\n";
+  return status;
 }
 
 }  // namespace

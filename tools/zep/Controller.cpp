@@ -101,13 +101,19 @@ bool IsNothing(TRemoteIdentity const& identity) {
   return identity.fType.empty() && identity.fModel.empty() && identity.fSerialNumber.empty();
 }
 
+EExitStatus StatusOf(TRemoteIdentity const& identity) {
+  if (IsComplete(identity)) return kExitComplete;
+  return IsNothing(identity) ? kExitNothing : kExitPartial;
+}
+
 TJson AsJson(TRemoteIdentity const& identity) {
-  TJson json = {{"host", identity.fHost},
-                {"type", OrNull(identity.fType)},
-                {"model", OrNull(identity.fModel)},
-                {"serialNumber", OrNull(identity.fSerialNumber)}};
-  if (!identity.fError.empty()) json["error"] = identity.fError;
-  return json;
+  TJson document = DocumentHead("zep remote", StatusOf(identity), identity.fError);
+  document["host"] = identity.fHost;
+  document["type"] = OrNull(identity.fType);
+  document["model"] = OrNull(identity.fModel);
+  document["serialNumber"] = OrNull(identity.fSerialNumber);
+  if (!identity.fError.empty()) document["error"] = identity.fError;  // the reason, under the name that it had first
+  return document;
 }
 
 std::string AsText(TRemoteIdentity const& identity) {

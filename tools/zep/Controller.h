@@ -26,6 +26,10 @@ TRemoteIdentity IdentityFrom(std::string const& host, std::string const& said, b
 bool IsComplete(TRemoteIdentity const& identity);
 bool IsNothing(TRemoteIdentity const& identity);
 
+// What zep ends with when it asks for this one alone.
+EExitStatus StatusOf(TRemoteIdentity const& identity);
+
+// A document of "zep remote".
 TJson AsJson(TRemoteIdentity const& identity);
 std::string AsText(TRemoteIdentity const& identity);
 

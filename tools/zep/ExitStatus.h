@@ -2,7 +2,7 @@
 
 namespace NQRVZEP20::zep {
 
-// What zep ends with.
+// What zep ends with, whatever the command. docs/formats.md has the table.
 enum EExitStatus {
   kExitComplete = 0,  // everything that was asked for
   kExitNothing = 1,   // nothing of it

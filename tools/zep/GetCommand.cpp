@@ -52,6 +52,16 @@ std::string WhyNotWritten(TArguments const& arguments, std::string const& file, 
   return Printable(file) + " exists" + (arguments.fNoClobber ? "" : "; --force overwrites it");
 }
 
+int Refuse(TRemote const& source, std::string const& file, std::string const& why, bool asJson) {
+  TTransferred refused;
+  refused.fOutcome = {kZEPStatusAlreadyExists, kExitNotWritten, why};
+  refused.fUrl = ShownUrlOf(source);
+  refused.fFile = file;
+  if (asJson) WriteOutput(AsText(DocumentOf(refused, "zep get")));
+  std::cerr << "zep: " << why << "\n";
+  return kExitNotWritten;
+}
+
 int Get(TArguments const& arguments) {
   if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the URL comes first, and the file behind it");
   TTarget const source = TargetOf(arguments.fUrl, false);
@@ -60,10 +70,7 @@ int Get(TArguments const& arguments) {
   std::error_code unknown;
   fs::file_status const status = fs::symlink_status(file, unknown);
   std::string const why = WhyNotWritten(arguments, file, status);
-  if (!why.empty()) {
-    std::cerr << "zep: " << why << "\n";
-    return kExitNotWritten;
-  }
+  if (!why.empty()) return Refuse(source.fRemote, file, why, arguments.fAsJson);
   bool const overwrites = fs::exists(status) || arguments.fForce;
   TTransferred const fetched = GetFile(source.fRemote, file, overwrites, arguments.fOptions);
   return TellOf(fetched, "zep get", arguments.fAsJson, arguments.fOptions);

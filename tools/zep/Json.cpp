@@ -1,6 +1,5 @@
 #include "Json.h"
 
-#include "ExitStatus.h"
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
 #include "ICIMProperty.h"
@@ -51,21 +50,22 @@ TJson PropertyAsJson(TNamespaceView const& view, ICIMInstance const& instance, I
 
 }  // namespace
 
-TJson DocumentHead(std::string const& what) {
+TJson DocumentHead(std::string const& what, EExitStatus status, std::string const& reason) {
   TJson document = {{"document", what}, {"version", kDocumentVersion}, {"zep", ZEP_VERSION}, {"sample", IsSampleSelected()}};
   if (IsSampleSelected()) document["label"] = kSampleLabel;
+  document["exitStatus"] = static_cast<int>(status);
+  document["reason"] = OrNull(reason);
   return document;
 }
 
 std::string AsText(TJson const& document) { return document.dump(2, ' ', false, TJson::error_handler_t::replace) + "\n"; }
 
+std::string AsLine(TJson const& document) { return document.dump(-1, ' ', false, TJson::error_handler_t::replace) + "\n"; }
+
 TJson OrNull(std::string const& text) { return text.empty() ? TJson(nullptr) : TJson(text); }
 
-std::string FailureAsJson(std::string const& what, std::string const& reason) {
-  TJson document = DocumentHead(what);
-  document["exitStatus"] = static_cast<int>(kExitNothing);
-  document["reason"] = reason;
-  return AsText(document);
+std::string FailureAsJson(std::string const& what, EExitStatus status, std::string const& reason) {
+  return AsLine(DocumentHead(what, status, reason));
 }
 
 TJson ValueAsJson(TCIMValue const& value) {

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "ExitStatus.h"
+#include "Failure.h"
 #include "Output.h"
 #include "TCIMValue.h"
 #include "TNamespaceView.h"
@@ -14,33 +16,24 @@ namespace NQRVZEP20::zep {
 using TJson = nlohmann::ordered_json;
 
 // The version of the documents that zep prints. It grows when a program that reads them would notice.
-constexpr int kDocumentVersion = 1;
+constexpr int kDocumentVersion = 2;
 
-// The head that every document has: what it is, its version, and whether it is about the sample.
-TJson DocumentHead(std::string const& what);
+// The head that every document has: what it is, its version, whether it is about the sample, what zep ends with, and why that
+// is not kExitComplete. The reason is empty for kExitComplete, and for nothing else.
+TJson DocumentHead(std::string const& what, EExitStatus status, std::string const& reason);
 
-// A document as text. Bytes that are no UTF-8 become the replacement character.
+// A document as text, in lines for people or in one line. Bytes that are not UTF-8 become the replacement character.
 std::string AsText(TJson const& document);
+std::string AsLine(TJson const& document);
 
 // The text; null for an empty one.
 TJson OrNull(std::string const& text);
 
-// The document of a command that told nothing, as text: the head, "exitStatus" (kExitNothing) and "reason".
-std::string FailureAsJson(std::string const& what, std::string const& reason);
+// The document of a command that failed before it had one of its own: the head alone, in one line.
+std::string FailureAsJson(std::string const& what, EExitStatus status, std::string const& reason);
 
-// Runs the work. When that throws, and JSON is wanted, the failure's document is printed and the exception goes on.
-template <class TWork>
-auto OrFailureDocument(std::string const& what, bool asJson, TWork work) {
-  try {
-    return work();
-  } catch (std::exception const& failure) {
-    if (asJson) WriteOutput(FailureAsJson(what, failure.what()));
-    throw;
-  }
-}
-
-// Booleans and numbers become their JSON kinds (a real that is not finite a text), arrays arrays, NULL null, and all
-// others their text.
+// Booleans and numbers become their JSON kinds, arrays arrays, NULL null, and all others their text. So do integers of 64 bits,
+// which many programs read as reals of 53 bits, and a real that is not finite.
 TJson ValueAsJson(TCIMValue const& value);
 
 // The type's name, with "[]" behind it for an array.

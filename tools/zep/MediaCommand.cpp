@@ -42,8 +42,8 @@ std::string AsText(std::vector<TMedium> const& media) {
   return table.GetText();
 }
 
-std::string AsJson(std::vector<TMedium> const& media) {
-  TJson document = DocumentHead("zep media");
+std::string AsJson(std::vector<TMedium> const& media, EExitStatus status, std::string const& reason) {
+  TJson document = DocumentHead("zep media", status, reason);
   document["labelsReadable"] = AreLabelsReadable();
   document["media"] = TJson::array();
   for (TMedium const& medium : media)
@@ -58,21 +58,24 @@ std::string AsJson(std::vector<TMedium> const& media) {
   return zep::AsText(document);
 }
 
+// Why the list is empty or lacks something; empty when it does not.
+std::string WhatIsMissing(std::vector<TMedium> const& media) {
+  if (media.empty()) return "there is no removable medium";
+  return AreLabelsReadable() ? "" : "labels and file systems can be read by root only";
+}
+
 int List(bool asJson) {
   std::vector<TMedium> const media = FindMedia();
-  if (!media.empty() || asJson) WriteOutput(asJson ? AsJson(media) : AsText(media));
-  if (media.empty()) {
-    std::cerr << "zep: there is no removable medium\n";
-    return kExitNothing;
-  }
-  if (AreLabelsReadable()) return kExitComplete;
-  std::cerr << "zep: labels and file systems can be read by root only\n";
-  return kExitPartial;
+  std::string const missing = WhatIsMissing(media);
+  EExitStatus const status = media.empty() ? kExitNothing : missing.empty() ? kExitComplete : kExitPartial;
+  if (!media.empty() || asJson) WriteOutput(asJson ? AsJson(media, status, missing) : AsText(media));
+  if (!missing.empty()) std::cerr << "zep: " << missing << "\n";
+  return status;
 }
 
 int Mount(std::string const& device, bool asJson) {
   TMountedMedium const medium(device);
-  TJson document = DocumentHead("zep media mount");
+  TJson document = DocumentHead("zep media mount", kExitComplete, "");
   document["device"] = medium.Device();
   document["mountPoint"] = medium.MountPoint();
   WriteOutput(asJson ? zep::AsText(document) : medium.Device() + " is mounted at " + medium.MountPoint() + "\n");
@@ -82,12 +85,14 @@ int Mount(std::string const& device, bool asJson) {
 int Unmount(std::string const& argument, bool asJson) {
   std::string const directory = WithoutTrailingSlashes(argument);
   std::vector<std::string> const stillMountedAt = UnmountDirectory(directory);
-  TJson document = DocumentHead("zep media umount");
+  EExitStatus const status = stillMountedAt.empty() ? kExitComplete : kExitPartial;
+  std::string const why = stillMountedAt.empty() ? "" : "the medium " + WhetherToTakeOut(stillMountedAt);
+  TJson document = DocumentHead("zep media umount", status, why);
   document["mountPoint"] = directory;
   document["stillMountedAt"] = stillMountedAt;
   WriteOutput(asJson ? zep::AsText(document)
                      : directory + " is unmounted; the medium " + WhetherToTakeOut(stillMountedAt) + "\n");
-  return stillMountedAt.empty() ? kExitComplete : kExitPartial;
+  return status;
 }
 
 int Media(TArguments const& arguments) {
@@ -100,7 +105,7 @@ int Media(TArguments const& arguments) {
 
 TRun AddMediaArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
-  CLI::App* const list = command.add_subcommand("list", "List them, which is also done without a word");
+  CLI::App* const list = command.add_subcommand(kListMedia, "List them, which is also done without a word");
   CLI::App* const mount = command.add_subcommand("mount", "Mount one at /mnt/key, a floppy at /mnt/floppy");
   CLI::App* const unmount = command.add_subcommand("umount", "Unmount one, so that it can be taken out");
   mount->add_option("device", arguments->fDevice, "The device, such as /dev/sdb; its first partition is tried as well")

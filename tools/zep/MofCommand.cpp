@@ -84,7 +84,7 @@ std::string AsText(std::string const& file, TCensus const& census) {
 }
 
 std::string AsJson(std::string const& file, TCensus const& census) {
-  TJson document = DocumentHead("zep mof");
+  TJson document = DocumentHead("zep mof", kExitComplete, "");
   document["file"] = file;
   for (TCount const& count : census.Counts()) document[count.fKey] = count.fCount;
   return zep::AsText(document);
@@ -98,7 +98,7 @@ std::string MofAsText(TArguments const& arguments) {
 }
 
 int Mof(TArguments const& arguments) {
-  WriteOutput(OrFailureDocument("zep mof", arguments.fAsJson, [&] { return MofAsText(arguments); }));
+  WriteOutput(MofAsText(arguments));
   return kExitComplete;
 }
 

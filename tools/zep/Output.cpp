@@ -9,10 +9,19 @@
 
 namespace NQRVZEP20::zep {
 
+namespace {
+
+bool gHasWrittenOutput = false;
+
+}  // namespace
+
 void WriteOutput(std::string const& text) {
+  gHasWrittenOutput = true;
   if (!WriteWhole(STDOUT_FILENO, text))
     throw std::system_error(errno, std::generic_category(), "standard output cannot be written");
 }
+
+bool HasWrittenOutput() { return gHasWrittenOutput; }
 
 TOutputGuard::TOutputGuard() : fOutput(::dup(STDOUT_FILENO)) {
   if (fOutput) ::dup2(STDERR_FILENO, STDOUT_FILENO);

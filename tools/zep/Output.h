@@ -10,6 +10,9 @@ namespace NQRVZEP20::zep {
 // went away ends the program by SIGPIPE, unless the caller of zep has that signal ignored.
 void WriteOutput(std::string const& text);
 
+// Whether WriteOutput was called: with --json a document is printed then, in part at least.
+bool HasWrittenOutput();
+
 // For as long as it lives, what anyone else in this process prints to standard output goes to standard error: plug-ins
 // must not write into a document.
 class TOutputGuard {

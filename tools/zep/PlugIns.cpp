@@ -107,16 +107,16 @@ std::vector<TNamespaceView> ViewsOf(std::vector<TPlugIn> const& plugIns) {
   return views;
 }
 
-std::string FailuresAsText(std::vector<TPlugIn> const& plugIns) {
-  std::string text;
-  auto const add = [&text](std::string const& name, std::string const& error) {
-    if (!error.empty()) text += Printable("zep: " + name + ": " + error) + "\n";
+std::vector<std::string> FailuresOf(std::vector<TPlugIn> const& plugIns) {
+  std::vector<std::string> failures;
+  auto const add = [&failures](std::string const& name, std::string const& error) {
+    if (!error.empty()) failures.push_back(name + ": " + error);
   };
   for (TPlugIn const& plugIn : plugIns) {
     add(plugIn.fName, plugIn.fError);
     for (TProviderRun const& provider : plugIn.fProviders) add(provider.fName, provider.fError);
   }
-  return text;
+  return failures;
 }
 
 std::string PlugInDirectory() { return std::filesystem::path(TOSSpecific::GetZEPRootPath()).lexically_normal().string(); }

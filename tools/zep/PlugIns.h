@@ -34,8 +34,8 @@ std::vector<TPlugIn> LoadPlugIns();
 // The namespaces of all providers that did not fail.
 std::vector<TNamespaceView> ViewsOf(std::vector<TPlugIn> const& plugIns);
 
-// A line for each plug-in and provider that failed, as zep says it.
-std::string FailuresAsText(std::vector<TPlugIn> const& plugIns);
+// "name: why" of each plug-in and provider that failed.
+std::vector<std::string> FailuresOf(std::vector<TPlugIn> const& plugIns);
 
 // The directory where plug-ins are looked for.
 std::string PlugInDirectory();

@@ -61,11 +61,9 @@ TOutcome Check(TRemote const& proxy, TTransferOptions const& options) {
 int Tell(std::string const& proxy, TOutcome const& outcome, bool asJson, bool quiet) {
   bool const works = outcome.fExit == kExitComplete;
   if (asJson) {
-    TJson document = DocumentHead("zep proxy-check");
+    TJson document = DocumentHead("zep proxy-check", outcome.fExit, outcome.fReason);
     document["proxy"] = proxy;
     document["works"] = works;
-    document["exitStatus"] = static_cast<int>(outcome.fExit);
-    document["reason"] = works ? TJson(nullptr) : TJson(outcome.fReason);
     WriteOutput(AsText(document));
   } else if (works && !quiet) {
     WriteOutput("The proxy " + proxy + " lets requests through.\n");

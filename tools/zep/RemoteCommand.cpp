@@ -116,9 +116,7 @@ int AskAll(std::vector<std::string> const& hosts, TAccount const& account, TArgu
 
 int AskOne(TAccount const& account, TArguments const& arguments) {
   return AskAll({arguments.fHost}, account, arguments, [&](TRemoteIdentity const& identity) {
-    TJson document = DocumentHead("zep remote");
-    document.update(AsJson(identity));
-    WriteOutput(arguments.fAsJson ? AsText(document) : AsText(identity));
+    WriteOutput(arguments.fAsJson ? AsText(AsJson(identity)) : AsText(identity));
     if (!identity.fError.empty()) std::cerr << "zep: " << Printable(identity.fHost + ": " + identity.fError) << "\n";
   });
 }
@@ -126,16 +124,14 @@ int AskOne(TAccount const& account, TArguments const& arguments) {
 int AskList(std::vector<std::string> const& hosts, TAccount const& account, TArguments const& arguments) {
   TProgress progress(hosts.size());
   return AskAll(hosts, account, arguments, [&](TRemoteIdentity const& identity) {
-    WriteOutput(AsJson(identity).dump(-1, ' ', false, TJson::error_handler_t::replace) + "\n");
+    WriteOutput(AsLine(AsJson(identity)));
     progress.Count(!IsComplete(identity));
   });
 }
 
 int Remote(TArguments const& arguments) {
-  if (arguments.fHost.empty() == arguments.fHostsFile.empty()) {
-    std::cerr << "zep: name either a host or a file of hosts (--hosts)\n";
-    return kExitUsage;
-  }
+  if (arguments.fHost.empty() == arguments.fHostsFile.empty())
+    throw TWrongUsage("name either a host or a file of hosts (--hosts)");
   std::vector<std::string> const hosts =
       arguments.fHostsFile.empty() ? std::vector<std::string>() : HostsIn(arguments.fHostsFile);
   if (!arguments.fDebugLog.empty()) WriteDebugLog(arguments.fDebugLog);

@@ -307,4 +307,14 @@ TReport MakeReport(std::vector<TPlugIn> plugIns) {
   return report;
 }
 
+std::string WhyNotComplete(TReport const& report) {
+  if (report.fStatus == kExitComplete) return "";
+  std::vector<std::string> unknown;
+  for (TReportRow const& row : report.fIdentity)
+    if (!row.fAnswer.fIsKnown) unknown.push_back(row.fLabel);
+  std::vector<std::string> reasons = FailuresOf(report.fPlugIns);
+  if (!unknown.empty()) reasons.insert(reasons.begin(), "unknown: " + Joined(unknown, ", "));
+  return Joined(reasons, "; ");
+}
+
 }  // namespace NQRVZEP20::zep

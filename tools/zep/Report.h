@@ -1,6 +1,7 @@
 #pragma once
 
 #include "ExitStatus.h"
+#include "Json.h"
 #include "PlugIns.h"
 #include "TNamespaceView.h"
 
@@ -29,10 +30,13 @@ struct TReport {
 
 TReport MakeReport(std::vector<TPlugIn> plugIns);
 
+// What is missing, and which plug-ins failed; empty when the report is complete.
+std::string WhyNotComplete(TReport const& report);
+
 std::string ReportAsText(TReport const& report);  // ReportText.cpp
 
-// One JSON document, with every instance of every namespace besides (ReportJson.cpp).
-std::string ReportAsJson(TReport const& report);
+// A document, with every instance of every namespace besides; its exit status is the report's (ReportJson.cpp).
+TJson ReportAsJson(TReport const& report);
 
 // What a file with the report is called: "zep-report-db1-20261121T041530Z" and the extension. The host name is the report's own,
 // "unknown" when it has none, in characters that every file system takes; the time is now, in UTC (ReportFileName.cpp).

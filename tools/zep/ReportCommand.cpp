@@ -18,6 +18,8 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
+constexpr char const* kToMedia = "zep report --to-media";
+
 struct TArguments {
   bool fAsJson = false;
   bool fSample = false;
@@ -46,33 +48,70 @@ std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::stri
   }
 }
 
-void WriteToMedium(TReport const& report, TArguments const& arguments) {
+// Returns the document that tells of it.
+TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
   std::string const name = ReportFileName(report, arguments.fAsJson ? ".json" : ".txt");
-  std::string const text = arguments.fAsJson ? ReportAsJson(report) : ReportAsText(report);
+  std::string const text = arguments.fAsJson ? AsText(ReportAsJson(report)) : ReportAsText(report);
   TMountedMedium const medium(arguments.fMedium);
   std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);
 
-  TJson document = DocumentHead("zep report --to-media");
+  TJson document = DocumentHead(kToMedia, report.fStatus, WhyNotComplete(report));
   document["device"] = medium.Device();
   document["file"] = name;
   document["bytes"] = text.size();
   document["stillMountedAt"] = stillMountedAt;
-  std::string const whetherToTakeOut = WhetherToTakeOut(stillMountedAt);
-  WriteOutput(arguments.fAsJson ? AsText(document)
-                                : "The report is " + name + " on " + medium.Device() + ", which " + whetherToTakeOut + ".\n");
+  if (!arguments.fAsJson)
+    WriteOutput("The report is " + name + " on " + medium.Device() + ", which " + WhetherToTakeOut(stillMountedAt) + ".\n");
+  return document;
 }
 
-int Report(TArguments const& arguments) {
+// The report's document, or that of the medium which the report was written to. For people it is printed by now.
+TJson PrintOrWrite(TReport const& report, TArguments const& arguments) {
+  if (!arguments.fMedium.empty()) return WriteToMedium(report, arguments);
+  if (!arguments.fAsJson) WriteOutput(ReportAsText(report));
+  return arguments.fAsJson ? ReportAsJson(report) : TJson();
+}
+
+// Adds what became of sending. A report that was not sent makes all of it a failure.
+void AddSending(TJson& document, TSentReport const& sent) {
+  TTransferred const& transferred = sent.fTransferred;
+  bool const isSent = transferred.fOutcome.fExit == kExitComplete;
+  if (!isSent) {
+    document["exitStatus"] = static_cast<int>(transferred.fOutcome.fExit);
+    document["reason"] = "it was not sent: " + transferred.fOutcome.fReason;
+  }
+  document["sent"] = {{"url", OrNull(transferred.fUrl)},
+                      {"bytes", isSent ? TJson(transferred.fBytes) : TJson(nullptr)},
+                      {"sha256", OrNull(transferred.fSha256)},
+                      {"keptIn", OrNull(sent.fKeptIn)}};
+}
+
+// The JSON document is printed at the end, as it tells what zep ends with.
+int MakeAndDeliver(TArguments const& arguments) {
   TTarget target{};
   if (!arguments.fTarget.empty()) target = TargetOf(arguments.fTarget, arguments.fBySftp);
   if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
   if (arguments.fSample) SelectSample();
   TReport const report = MakeReport(LoadPlugIns());
-  if (!arguments.fMedium.empty())
-    WriteToMedium(report, arguments);
-  else
-    WriteOutput(arguments.fAsJson ? ReportAsJson(report) : ReportAsText(report));
-  return arguments.fTarget.empty() ? report.fStatus : SendReport(report, target, arguments.fOptions);
+  EExitStatus status = report.fStatus;
+  TJson document = PrintOrWrite(report, arguments);
+  if (!arguments.fTarget.empty()) {
+    TSentReport const sent = SendReport(report, target, arguments.fOptions);
+    if (sent.fTransferred.fOutcome.fExit != kExitComplete) status = sent.fTransferred.fOutcome.fExit;
+    AddSending(document, sent);
+  }
+  if (arguments.fAsJson) WriteOutput(AsText(document));
+  return status;
+}
+
+int Report(TArguments const& arguments) {
+  try {
+    return MakeAndDeliver(arguments);
+  } catch (std::exception const& failure) {
+    bool const isOfMedium = !arguments.fMedium.empty() && arguments.fAsJson && !HasWrittenOutput();
+    if (isOfMedium) WriteOutput(FailureAsJson(kToMedia, StatusOf(failure), failure.what()));
+    throw;
+  }
 }
 
 }  // namespace

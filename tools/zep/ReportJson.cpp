@@ -55,10 +55,9 @@ void AddInstances(TJson& document, std::vector<TPlugIn> const& plugIns) {
 
 }  // namespace
 
-std::string ReportAsJson(TReport const& report) {
-  TJson document = DocumentHead("zep report");
+TJson ReportAsJson(TReport const& report) {
+  TJson document = DocumentHead("zep report", report.fStatus, WhyNotComplete(report));
   document["status"] = NameOf(report.fStatus);
-  document["exitStatus"] = static_cast<int>(report.fStatus);
   document["head"] = report.fHead;
   document["smbiosTableFile"] = OrNull(TableFile());
   document["identity"] = RowsAsJson(report.fIdentity);
@@ -66,7 +65,7 @@ std::string ReportAsJson(TReport const& report) {
   document["plugInDirectory"] = PlugInDirectory();
   document["plugIns"] = PlugInsAsJson(report.fPlugIns);
   AddInstances(document, report.fPlugIns);
-  return AsText(document);
+  return document;
 }
 
 }  // namespace NQRVZEP20::zep

@@ -3,6 +3,7 @@
 #include "Commands.h"
 #include "ExitStatus.h"
 #include "Failure.h"
+#include "Json.h"
 #include "Output.h"
 #include "TOSSpecific.h"
 #include "Text.h"
@@ -19,39 +20,55 @@ namespace {
 
 constexpr int kForEver = -1;
 
+struct TArguments {
+  int fTimeoutSeconds = kForEver;
+  bool fAsJson = false;
+};
+
 // The library tells only that a command failed, not how.
 std::string WhyItFailed(std::string const& program, int timeout) {
-  std::string reason = "zep: " + Printable(program) + " could not be executed, did not exit with 0 or was ended by a signal";
+  std::string reason = program + " could not be executed, did not exit with 0 or was ended by a signal";
   if (timeout != kForEver) reason += ", or was silent for more than " + std::to_string(timeout) + " s and is left running";
-  return reason + "\n";
+  return reason;
 }
 
-int RunCommandLine(std::vector<std::string> commandLine, int timeout) {
+std::string AsJson(std::vector<std::string> const& commandLine, std::string const& output, std::string const& failure) {
+  TJson document = DocumentHead("zep run", failure.empty() ? kExitComplete : kExitNothing, failure);
+  document["command"] = commandLine;
+  document["output"] = output;
+  return AsText(document);
+}
+
+int RunCommandLine(std::vector<std::string> commandLine, TArguments const& arguments) {
   if (!commandLine.empty()) commandLine.erase(commandLine.begin());  // kCommandFollows
   if (commandLine.empty() || commandLine.front().empty()) throw TWrongUsage("there is no command to run");
   std::string const program = commandLine.front();
-  commandLine.erase(commandLine.begin());
   std::string output;
-  int const result = TOSSpecific::SpawnProcess(program, commandLine, output, timeout);
-  WriteOutput(output);
-  if (result == 0) return kExitComplete;
-  std::cerr << WhyItFailed(program, timeout);
+  int const result =
+      TOSSpecific::SpawnProcess(program, {commandLine.begin() + 1, commandLine.end()}, output, arguments.fTimeoutSeconds);
+  std::string const failure = result == 0 ? "" : WhyItFailed(program, arguments.fTimeoutSeconds);
+  WriteOutput(arguments.fAsJson ? AsJson(commandLine, output, failure) : output);
+  if (failure.empty()) return kExitComplete;
+  std::cerr << "zep: " << Printable(failure) << "\n";
   return kExitNothing;
 }
 
 }  // namespace
 
 TRun AddRunArguments(CLI::App& command) {
-  auto const timeout = std::make_shared<int>(kForEver);
-  command.add_option("--timeout", *timeout, "The longest silence allowed, in seconds; -1, the default, waits for ever")
+  auto const arguments = std::make_shared<TArguments>();
+  command
+      .add_option("--timeout", arguments->fTimeoutSeconds,
+                  "The longest silence allowed, in seconds; -1, the default, waits for ever")
       ->check(CLI::Range(kForEver, std::numeric_limits<int>::max()));
+  command.add_flag("--json", arguments->fAsJson, "Print one JSON document, with the output in it");
   command.prefix_command();  // all from the first word that is none of the options is the command's
   command.footer(
       "zep run [OPTIONS] [--] COMMAND [ARGUMENT]...\n"
       "What the command prints, on standard output and standard error, is printed when it has ended. A zero byte\n"
       "cuts off the rest of the chunk in which it came.\n"
       "Exit status: 0 when the command ran to its end and exited with 0, 1 when not, 64 for wrong usage.");
-  return [&command, timeout] { return RunCommandLine(command.remaining(), *timeout); };
+  return [&command, arguments] { return RunCommandLine(command.remaining(), *arguments); };
 }
 
 }  // namespace NQRVZEP20::zep

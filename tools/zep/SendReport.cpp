@@ -1,8 +1,8 @@
 #include "SendReport.h"
 
-#include "TOSSpecific.h"
+#include "Failure.h"
+#include "Gzip.h"
 #include "TScratchDirectory.h"
-#include "TZEPException.h"
 #include "Text.h"
 
 #include <cerrno>
@@ -15,54 +15,62 @@ namespace NQRVZEP20::zep {
 namespace {
 
 void WriteReport(TReport const& report, std::string const& file) {
-  std::ofstream stream(file);
-  stream << ReportAsJson(report);
+  std::ofstream stream(file, std::ios::binary);
+  stream << Gzipped(AsText(ReportAsJson(report)));
   stream.close();
   if (!stream) throw std::system_error(errno, std::generic_category(), file);
 }
 
-// The file that gzip makes of this one; the file itself when it makes none.
-std::string Packed(std::string const& file) {
-  std::string complaints;
-  try {
-    if (TOSSpecific::SpawnProcess("gzip", {"-n", file}, complaints, -1) == 0) return file + ".gz";
-  } catch (TZEPException const& failure) {
-    complaints = failure.what();
-  }
-  std::cerr << "zep: the report could not be packed: " << Printable(complaints) << "\n";
-  return file;
+// A sending that failed before there was a transfer.
+TTransferred NotBegun(std::exception const& failure) {
+  TTransferred transferred;
+  transferred.fOutcome = {kZEPStatusFail, StatusOf(failure), failure.what()};
+  return transferred;
 }
 
-void KeepAndSayWhere(std::string const& file, TScratchDirectory& directory) {
+TTransferred Send(std::string const& file, TTarget const& target, TTransferOptions const& options) {
+  try {
+    return SendFile(file, target, "", options);
+  } catch (std::exception const& failure) {
+    return NotBegun(failure);
+  }
+}
+
+TSentReport WriteAndSend(TReport const& report, TTarget const& target, TTransferOptions const& options) {
+  TScratchDirectory directory("zep-report");
+  std::string const file = directory.Path(ReportFileName(report, ".json.gz"));
+  WriteReport(report, file);
+  TSentReport sent{Send(file, target, options), ""};
+  if (sent.fTransferred.fOutcome.fExit == kExitComplete) return sent;
   directory.Keep();
-  std::cerr << "zep: the report is kept in " << Printable(file) << "\n";
+  sent.fKeptIn = file;
+  return sent;
 }
 
-TTransferred SendOrKeep(std::string const& file, TScratchDirectory& directory, TTarget const& target,
-                        TTransferOptions const& options) {
-  try {
-    TTransferred const sent = SendFile(file, target, "", options);
-    if (sent.fOutcome.fExit == kExitComplete) return sent;
-    std::cerr << "zep: " << sent.fUrl << ": " << sent.fOutcome.fReason << "\n";
-    KeepAndSayWhere(file, directory);
-    return sent;
-  } catch (...) {
-    KeepAndSayWhere(file, directory);
-    throw;
+void Tell(TSentReport const& sent, bool isQuiet) {
+  TTransferred const& transferred = sent.fTransferred;
+  if (transferred.fOutcome.fExit == kExitComplete) {
+    if (isQuiet) return;
+    std::cerr << "zep: sent to " << transferred.fUrl << ": " << transferred.fBytes << " bytes, SHA-256 " << transferred.fSha256
+              << "\n";
+    return;
   }
+  std::string const url = transferred.fUrl.empty() ? "" : transferred.fUrl + ": ";
+  std::cerr << "zep: " << url << Printable(transferred.fOutcome.fReason) << "\n";
+  if (!sent.fKeptIn.empty()) std::cerr << "zep: the report is kept in " << Printable(sent.fKeptIn) << "\n";
 }
 
 }  // namespace
 
-EExitStatus SendReport(TReport const& report, TTarget const& target, TTransferOptions const& options) {
-  TScratchDirectory directory("zep-report");
-  std::string const file = directory.Path(ReportFileName(report, ".json"));
-  WriteReport(report, file);
-  TTransferred const sent = SendOrKeep(Packed(file), directory, target, options);
-  if (sent.fOutcome.fExit != kExitComplete) return sent.fOutcome.fExit;
-  if (!options.fQuiet)
-    std::cerr << "zep: sent to " << sent.fUrl << ": " << sent.fBytes << " bytes, SHA-256 " << sent.fSha256 << "\n";
-  return report.fStatus;
+TSentReport SendReport(TReport const& report, TTarget const& target, TTransferOptions const& options) {
+  TSentReport sent;
+  try {
+    sent = WriteAndSend(report, target, options);
+  } catch (std::exception const& failure) {
+    sent.fTransferred = NotBegun(failure);
+  }
+  Tell(sent, options.fQuiet);
+  return sent;
 }
 
 }  // namespace NQRVZEP20::zep

@@ -247,7 +247,7 @@ std::string ElementAsText(TNamespaceView const& view, boost::shared_ptr<ICIMElem
 }
 
 std::string ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElement> const& element) {
-  TJson document = DocumentHead("zep show");
+  TJson document = DocumentHead("zep show", kExitComplete, "");
   document["object"] = ForElement(
       element, [&](ICIMInstance const& instance) { return InstanceAsJson(view, instance); },
       [&](boost::shared_ptr<ICIMClass const> cls) { return ClassAsJson(view, cls); });
@@ -255,37 +255,38 @@ std::string ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElem
 }
 
 struct TSearch {
-  std::string fText;      // of what was found; empty when nothing was
-  std::string fFailures;  // a line for each provider that failed
+  std::string fText;                   // of what was found; empty when nothing was
+  std::vector<std::string> fFailures;  // of the providers
 };
 
 TSearch Search(TArguments const& arguments) {
   TSearch search;
   bool const isMof = !arguments.fMofFile.empty();
   std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugIns();
-  search.fFailures = FailuresAsText(plugIns);
+  search.fFailures = FailuresOf(plugIns);
   for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
     std::string const failure = FailureOf([&] {
       auto const element = Find(view, arguments.fPath);
       if (element) search.fText = arguments.fAsJson ? ElementAsJson(view, element) : ElementAsText(view, element);
     });
     if (!search.fText.empty()) break;
-    if (!failure.empty()) search.fFailures += Printable("zep: " + view.GetProviderName() + ": " + failure) + "\n";
+    if (!failure.empty()) search.fFailures.push_back(view.GetProviderName() + ": " + failure);
   }
   return search;
 }
 
 int Show(TArguments const& arguments) {
   if (arguments.fSample) SelectSample();
-  TSearch const search = OrFailureDocument("zep show", arguments.fAsJson, [&] { return Search(arguments); });
+  TSearch search = Search(arguments);
   if (!search.fText.empty()) {
     WriteOutput(search.fText);
     return kExitComplete;
   }
-  std::string const why = (arguments.fMofFile.empty() ? "no provider has the" : arguments.fMofFile + " has no") + " object \"" +
-                          arguments.fPath + "\"";
-  if (arguments.fAsJson) WriteOutput(FailureAsJson("zep show", why));
-  std::cerr << search.fFailures << "zep: " << Printable(why) << "\n";
+  std::vector<std::string>& reasons = search.fFailures;
+  reasons.push_back((arguments.fMofFile.empty() ? "no provider has the" : arguments.fMofFile + " has no") + " object \"" +
+                    arguments.fPath + "\"");
+  if (arguments.fAsJson) WriteOutput(FailureAsJson("zep show", kExitNothing, Joined(reasons, "; ")));
+  for (std::string const& reason : reasons) std::cerr << "zep: " << Printable(reason) << "\n";
   return kExitNothing;
 }
 

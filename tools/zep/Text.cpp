@@ -91,6 +91,12 @@ std::vector<std::string> Wrapped(std::string_view text, std::size_t width) {
   return lines;
 }
 
+std::string Joined(std::vector<std::string> const& texts, std::string const& separator) {
+  std::string joined;
+  for (std::string const& text : texts) joined += (&text == &texts.front() ? "" : separator) + text;
+  return joined;
+}
+
 std::string SizeText(std::uint64_t bytes) {
   constexpr char const* units[] = {"B", "KiB", "MiB", "GiB", "TiB"};
   double size = static_cast<double>(bytes);

@@ -17,6 +17,9 @@ std::size_t WidthOf(std::string_view text);
 // Lines of at most `width` characters, broken at blanks where that is possible; at least one line.
 std::vector<std::string> Wrapped(std::string_view text, std::size_t width);
 
+// The texts with that between each two.
+std::string Joined(std::vector<std::string> const& texts, std::string const& separator);
+
 // A size for people, rounded to a tenth: "390.6 KiB", "4 MiB".
 std::string SizeText(std::uint64_t bytes);
 

@@ -304,18 +304,21 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
   return Completed(transferred, file, overwrites);
 }
 
+TJson DocumentOf(TTransferred const& transferred, std::string const& command) {
+  bool const isComplete = transferred.fOutcome.fExit == kExitComplete;
+  TJson document = DocumentHead(command, transferred.fOutcome.fExit, transferred.fOutcome.fReason);
+  document["url"] = transferred.fUrl;
+  document["file"] = transferred.fFile;
+  document["bytes"] = isComplete ? TJson(transferred.fBytes) : TJson(nullptr);
+  document["sha256"] = isComplete ? TJson(transferred.fSha256) : TJson(nullptr);
+  return document;
+}
+
 int TellOf(TTransferred const& transferred, std::string const& command, bool asJson, TTransferOptions const& options) {
   TOutcome const& outcome = transferred.fOutcome;
   bool const isComplete = outcome.fExit == kExitComplete;
   if (asJson) {
-    TJson document = DocumentHead(command);
-    document["url"] = transferred.fUrl;
-    document["file"] = transferred.fFile;
-    document["exitStatus"] = static_cast<int>(outcome.fExit);
-    document["bytes"] = isComplete ? TJson(transferred.fBytes) : TJson(nullptr);
-    document["sha256"] = isComplete ? TJson(transferred.fSha256) : TJson(nullptr);
-    document["reason"] = isComplete ? TJson(nullptr) : TJson(outcome.fReason);
-    WriteOutput(AsText(document));
+    WriteOutput(AsText(DocumentOf(transferred, command)));
   } else if (isComplete && !options.fQuiet) {
     WriteOutput(transferred.fUrl + ", " + Printable(transferred.fFile) + ": " + std::to_string(transferred.fBytes) +
                 " bytes, SHA-256 " + transferred.fSha256 + "\n");

@@ -53,6 +53,9 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
 // breaks off; one transfer at a time has it. `overwrites`: whether a file may be there.
 TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, TTransferOptions const& options);
 
+// What became of a transfer, as a document of that command.
+TJson DocumentOf(TTransferred const& transferred, std::string const& command);
+
 // Says on standard output, or as one JSON document, what became of a transfer, and on standard error why it failed. Returns
 // its exit status.
 int TellOf(TTransferred const& transferred, std::string const& command, bool asJson, TTransferOptions const& options);

@@ -132,6 +132,15 @@ std::string AsText(TFindings const& findings) {
   return text;
 }
 
+// Empty when nothing is.
+std::string WhatIsMissing(TFindings const& findings) {
+  if (findings.fPacFile && !findings.fPacFile->fFailure.empty())
+    return "the file was not fetched: " + findings.fPacFile->fFailure;
+  if (!findings.fSearch.fUrl.empty()) return "";
+  if (findings.fSearch.fAskings.empty()) return "no interface has a name that begins with \"eth\"";
+  return findings.fSearch.fFailure.empty() ? "nobody named a proxy configuration file" : findings.fSearch.fFailure;
+}
+
 TJson AskingAsJson(TAsking const& asking) {
   TJson json = {{"interface", OrNull(asking.fInterface)}};
   json["up"] = asking.fInterface.empty() ? TJson(nullptr) : TJson(asking.fIsUp);
@@ -150,9 +159,8 @@ TJson AskingAsJson(TAsking const& asking) {
 }
 
 std::string AsJson(TFindings const& findings) {
-  TJson document = DocumentHead("zep wpad");
+  TJson document = DocumentHead("zep wpad", findings.ExitStatus(), WhatIsMissing(findings));
   document["status"] = NameOf(findings.ExitStatus());
-  document["exitStatus"] = static_cast<int>(findings.ExitStatus());
   document["url"] = OrNull(findings.fSearch.fUrl);
   document["stoppedClients"] = findings.fStoppedClients;
   document["messageBytes"] = AutoProxyDiscovery::kMessageSize;
@@ -167,21 +175,7 @@ std::string AsJson(TFindings const& findings) {
   return zep::AsText(document);
 }
 
-// What is missing, for standard error; empty when nothing is.
-std::string WhatIsMissing(TFindings const& findings) {
-  if (findings.fPacFile && !findings.fPacFile->fFailure.empty())
-    return "the file was not fetched: " + Printable(findings.fPacFile->fFailure);
-  if (!findings.fSearch.fUrl.empty()) return "";
-  if (findings.fSearch.fAskings.empty()) return "no interface has a name that begins with \"eth\"";
-  return findings.fSearch.fFailure.empty() ? "nobody named a proxy configuration file" : findings.fSearch.fFailure;
-}
-
 // ---- The steps ----
-
-int NothingBecause(std::string const& reason) {
-  std::cerr << "zep: " << reason << "\n";
-  return kExitNothing;
-}
 
 // False, with the clients left alone, when the user does not want it.
 bool StopClients(bool isConfirmed) {
@@ -200,14 +194,14 @@ TSearch Search() {
 void Tell(TFindings const& findings, bool asJson) {
   WriteOutput(asJson ? AsJson(findings) : AsText(findings));
   std::string const missing = WhatIsMissing(findings);
-  if (!missing.empty()) std::cerr << "zep: " << missing << "\n";
+  if (!missing.empty()) std::cerr << "zep: " << Printable(missing) << "\n";
 }
 
 int Wpad(TArguments const& arguments) {
   std::string const whyNot = WhyNoListening();
-  if (!whyNot.empty()) return NothingBecause(whyNot);
+  if (!whyNot.empty()) throw std::runtime_error(whyNot);
   if (!arguments.fKeepsClients && !StopClients(arguments.fIsConfirmed))
-    return NothingBecause("nothing was done; --yes confirms, and --no-stop leaves the DHCP clients alone");
+    throw std::runtime_error("nothing was done; --yes confirms, and --no-stop leaves the DHCP clients alone");
   TFindings findings{Search(), !arguments.fKeepsClients, {}};
   std::string const& url = findings.fSearch.fUrl;
   if (arguments.fFetches && !url.empty()) findings.fPacFile = FetchPacFile(url);

@@ -3,6 +3,7 @@
 #include "Commands.h"
 #include "ExitStatus.h"
 #include "Failure.h"
+#include "Json.h"
 #include "Output.h"
 #include "Text.h"
 
@@ -36,6 +37,7 @@ constexpr TCommand kCommands[] = {
     {"get", "Fetch a file from an FTP or SFTP server", AddGetArguments},
     {"proxy-check", "Tell whether a web proxy lets requests through", AddProxyCheckArguments},
     {"wpad", "Find the proxy configuration file that the DHCP server names", AddWpadArguments},
+    {"help", "Tell how zep, or one of its commands, is called", AddHelpArguments},
 };
 
 // The option's own name: of "--name=value" and "-nvalue" without the value.
@@ -54,13 +56,14 @@ std::size_t WordsOfZep(std::vector<std::string> const& words) {
 }
 
 // The arguments, the last one first, as CLI11 takes them. It would take "--send=" for one whose value is the next word, and
-// what stands behind the "--" of "zep run" for options.
-std::vector<std::string> ArgumentsOf(int argc, char const* const* argv) {
-  std::vector<std::string> words(argv + 1, argv + argc);
+// what stands behind the "--" of "zep run" for options; and it would obey "--json=false".
+std::vector<std::string> ArgumentsOf(std::vector<std::string> words) {
   std::size_t const end = WordsOfZep(words);
-  for (std::size_t at = 0; at < end; ++at)
+  for (std::size_t at = 0; at < end; ++at) {
     if (words[at].rfind("--", 0) == 0 && words[at].find('=') == words[at].size() - 1)
       throw TWrongUsage(NameOfOption(words[at]) + kIsEmpty);
+    if (words[at].rfind("--json=", 0) == 0) throw TWrongUsage("--json takes no value");
+  }
   if (end < words.size() && words.front() == "run") {
     if (words[end] == "--") words.erase(words.begin() + static_cast<std::ptrdiff_t>(end));
     words.insert(words.begin() + static_cast<std::ptrdiff_t>(end), kCommandFollows);
@@ -143,20 +146,23 @@ int Answer(CLI::App const& app, CLI::Success const& question) {
   return kExitComplete;
 }
 
-int Run(int argc, char const* const* argv) {
-  CLI::App app("zep tells what a server knows of itself, through the provider plug-ins beside libzepcore.so.", "zep");
+using TRuns = std::map<CLI::App const*, TRun>;
+
+TRuns AddCommands(CLI::App& app) {
+  TRuns runs;
   app.set_version_flag("--version", "zep " ZEP_VERSION " (build " ZEP_BUILD_ID ")");
   app.require_subcommand(1);
   app.footer("zep COMMAND --help tells more of a command.");
-
-  std::map<CLI::App const*, TRun> runs;
   for (TCommand const& command : kCommands) {
     CLI::App* const added = app.add_subcommand(command.fName, command.fDescription);
     runs[added] = command.fAddArguments(*added);
   }
+  return runs;
+}
 
+int Run(CLI::App& app, TRuns const& runs, std::vector<std::string> const& words) {
   try {
-    app.parse(ArgumentsOf(argc, argv));
+    app.parse(ArgumentsOf(words));
   } catch (CLI::Success const& question) {
     return Answer(app, question);
   } catch (CLI::ParseError const& refusal) {
@@ -169,16 +175,48 @@ int Run(int argc, char const* const* argv) {
   return runs.at(app.get_subcommands().front())();
 }
 
+// ---- Failures ----
+
+// Read from the words: CLI11 may have stopped before the option.
+bool IsJsonWanted(std::vector<std::string> const& words) {
+  auto const end = words.begin() + static_cast<std::ptrdiff_t>(WordsOfZep(words));
+  return std::any_of(words.begin(), end, [](std::string const& word) { return word == "--json"; });
+}
+
+// "zep media mount", from the words too; "zep" when the first one is not a command.
+std::string NameOfDocument(CLI::App const& app, std::vector<std::string> const& words) {
+  std::string name = app.get_name();
+  CLI::App const* command = words.empty() ? nullptr : CommandNamed(app, words.front());
+  if (command != nullptr) name += " " + command->get_name();
+  for (std::size_t at = 1; command != nullptr && at < WordsOfZep(words); ++at)
+    if (CLI::App const* const below = CommandNamed(*command, words[at])) {
+      command = below;
+      if (command->get_name() != kListMedia) name += " " + command->get_name();
+    }
+  return name;
+}
+
+// A document that is printed already, in part perhaps, stays the only one.
+void WriteFailure(std::string const& document, std::exception const& failure) {
+  if (HasWrittenOutput()) return;
+  std::string const why = FailureOf([&] { WriteOutput(FailureAsJson(document, StatusOf(failure), failure.what())); });
+  if (!why.empty()) std::cerr << "zep: " << Printable(why) << '\n';
+}
+
+int RunOrFail(std::vector<std::string> const& words) {
+  CLI::App app("zep tells what a server knows of itself, through the provider plug-ins beside libzepcore.so.", "zep");
+  TRuns const runs = AddCommands(app);
+  try {
+    return Run(app, runs, words);
+  } catch (std::exception const& failure) {
+    std::cerr << "zep: " << Printable(failure.what()) << '\n';
+    if (IsJsonWanted(words)) WriteFailure(NameOfDocument(app, words), failure);
+    return StatusOf(failure);
+  }
+}
+
 }  // namespace
 
 }  // namespace NQRVZEP20::zep
 
-int main(int argc, char** argv) try {
-  return NQRVZEP20::zep::Run(argc, argv);
-} catch (NQRVZEP20::zep::TWrongUsage const& failure) {
-  std::cerr << "zep: " << NQRVZEP20::zep::Printable(failure.what()) << '\n';
-  return NQRVZEP20::zep::kExitUsage;
-} catch (std::exception const& failure) {
-  std::cerr << "zep: " << NQRVZEP20::zep::Printable(failure.what()) << '\n';
-  return NQRVZEP20::zep::kExitNothing;
-}
+int main(int argc, char** argv) { return NQRVZEP20::zep::RunOrFail({argv + 1, argv + argc}); }

@@ -2,6 +2,7 @@
 
 #include "TOSSpecific.h"
 #include "tests/system/ipmi/IpmiBed.h"
+#include "tests/tools/zep/Envelope.h"
 #include "tests/tools/zep/Zep.h"
 
 #include <gmock/gmock.h>
@@ -102,6 +103,7 @@ TEST_F(ZepRemoteTest, TellsTypeModelAndSerialNumber) {
 
   zep::TRun const json = Run({"127.0.0.1", "--json"});
   EXPECT_EQ(json.status, 0);
+  zep::ExpectEnvelope(json.output, 0, "zep remote");
   EXPECT_EQ(zep::JsonOf(json)["type"], "1234");
   EXPECT_EQ(zep::JsonOf(json)["model"], "AB7");
   EXPECT_EQ(zep::JsonOf(json)["serialNumber"], "KQ12345");
@@ -140,7 +142,8 @@ TEST_F(ZepRemoteTest, WhatIsMissingIsTold) {
   EXPECT_EQ(run.status, 2);
   EXPECT_EQ(zep::JsonOf(run)["type"], "1234");
   EXPECT_TRUE(zep::JsonOf(run)["serialNumber"].is_null());
-  EXPECT_EQ(zep::JsonOf(run)["error"], "the controller did not tell everything");
+  zep::ExpectEnvelope(run.output, 2, "zep remote");
+  EXPECT_EQ(zep::JsonOf(run)["reason"], "the controller did not tell everything");
 }
 
 TEST_F(ZepRemoteTest, FruDataThatNobodyProgrammedAreToldAsSuch) {

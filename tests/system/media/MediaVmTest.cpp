@@ -3,6 +3,7 @@
 
 #include "tests/Support.h"
 #include "tests/os/Programs.h"
+#include "tests/tools/zep/Envelope.h"
 
 #include <gmock/gmock.h>
 #include <nlohmann/json.hpp>
@@ -135,6 +136,7 @@ nlohmann::json MediumIn(std::string const& document, std::string const& device) 
 
 TEST_F(MediaVmTest, ZepListsMediaWithLabelAndMountPoint) {
   std::string const list = Result("list.json"), mounted = Result("list-mounted.json");
+  zep::ExpectEnvelope(list, 0, "zep media");
   EXPECT_EQ(MediumIn(list, "/dev/sdb1"), nlohmann::json::parse(R"({"device":"/dev/sdb1","description":"QEMU HARDDISK",
     "size":7340032,"label":"STICK","fileSystem":"vfat","readOnly":false,"mounted":false,"mountPoints":[]})"));
   EXPECT_EQ(MediumIn(list, "/dev/sdc")["label"], "VMEDIA");

@@ -2,6 +2,7 @@
 
 #include "ZEPExport.h"
 #include "tests/system/media/MediaSupport.h"
+#include "tests/tools/zep/Envelope.h"
 #include "tests/tools/zep/Zep.h"
 #include "tools/zep/TMountedMedium.h"
 
@@ -115,6 +116,8 @@ TEST_F(ZepMediaTest, MakesTheMountPointAndPrintsJson) {
               TLoopDevice const loop(dir_.Path("key"));
               auto const mount = JsonOf(installation_->Run({{"media", "mount", loop.Path(), "--json"}}));
               auto const unmount = JsonOf(installation_->Run({{"media", "umount", "/mnt/key", "--json"}}));
+              ExpectEnvelope(mount, 0, "zep media mount");
+              ExpectEnvelope(unmount, 0, "zep media umount");
               bool const isTheDevice = mount["device"] == loop.Path();
               return std::string(mount["mountPoint"]) + " " + std::string(unmount["mountPoint"]) + (isTheDevice ? "" : " other");
             }),
@@ -235,7 +238,9 @@ TEST_F(ZepMediaTest, AMediumThatIsMountedElsewhereTooCannotBeTakenOut) {
               text += "..." + report.output.substr(report.output.find(" on ")) + "exit status " + std::to_string(report.status) +
                       "\n";
               Do("umount '/mnt/b c'; mount " + loop.Path() + " /mnt/key");
-              text += JsonOf(installation_->Run({{"media", "umount", "/mnt/key", "--json"}}))["stillMountedAt"].dump() + "\n";
+              TRun const unmounted = installation_->Run({{"media", "umount", "/mnt/key", "--json"}});
+              ExpectEnvelope(unmounted.output, 2, "zep media umount");
+              text += JsonOf(unmounted)["stillMountedAt"].dump() + "\n";
               TRun const asJson = installation_->Run({{"report", "--json", "--sample", "--to-media", loop.Path()}});
               text += JsonOf(asJson)["stillMountedAt"].dump() + "\n";
               text += Zep({"media", "umount", "/mnt/a"});
@@ -336,7 +341,7 @@ TEST_F(ZepMediaTest, AJsonReportIsAFileAndAnAnswer) {
               TRun const run = installation_->Run({{"report", "--json", "--sample", "--to-media", loop.Path()}});
               EXPECT_EQ(run.status, 0) << run.errors;
               auto const answer = JsonOf(run);
-              EXPECT_EQ(answer["document"], "zep report --to-media");
+              ExpectEnvelope(answer, 0, "zep report --to-media");
               EXPECT_EQ(answer["device"], loop.Path());
               Do("mount " + dir_.Path("key") + " /mnt/key");
               std::string const report = ReadFile("/mnt/key/" + answer["file"].get<std::string>());
@@ -350,7 +355,7 @@ TEST_F(ZepMediaTest, AJsonReportIsAFileAndAnAnswer) {
 
 // No success is told, no report is left, and the medium is unmounted.
 void ExpectFailure(std::string const& text, std::string const& reason) {
-  EXPECT_THAT(text, StartsWith("zep: zep-report-sample-server-"));
+  EXPECT_THAT(text, HasSubstr("zep: zep-report-sample-server-"));
   EXPECT_THAT(text, HasSubstr(" cannot be written on LOOP: " + reason + "\n"));
   EXPECT_THAT(text, HasSubstr("exit status 1\n"));
   EXPECT_THAT(text, Not(HasSubstr("can be taken out")));

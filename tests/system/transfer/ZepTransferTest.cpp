@@ -2,6 +2,7 @@
 
 #include "tests/os/Programs.h"
 #include "tests/system/transfer/Servers.h"
+#include "tests/tools/zep/Envelope.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -99,17 +100,18 @@ TEST_F(ZepTransferTest, SendsAndFetchesWithAChecksum) {
 
 TEST_F(ZepTransferTest, PrintsADocument) {
   auto const sent = nlohmann::json::parse(Zep("send --json " + Local("f", "text") + " " + Url("f")).output);
-  EXPECT_EQ(sent["document"], "zep send");
+  zep::ExpectEnvelope(sent, 0, "zep send");
   EXPECT_EQ(sent["url"], "ftp://zep@127.0.0.1:" + server_->Port() + "/f");
   EXPECT_EQ(sent["bytes"], 4);
   EXPECT_EQ(sent["sha256"], ChecksumOf(dir_.Path("f")));
-  EXPECT_EQ(sent["exitStatus"], 0);
-  EXPECT_TRUE(sent["reason"].is_null());
+
+  TProgramRun const fetched = Zep("get --json " + Url("f") + " " + dir_.Path("back"));
+  EXPECT_EQ(fetched.exitCode, kComplete);
+  zep::ExpectEnvelope(fetched.output, 0, "zep get");
 
   std::string const failed = RunProgram(kZep + "get --json " + Url("none") + " " + dir_.Path("x") + " 2> /dev/null").output;
   auto const document = nlohmann::json::parse(failed);
-  EXPECT_EQ(document["document"], "zep get");
-  EXPECT_EQ(document["exitStatus"], 1);
+  zep::ExpectEnvelope(document, 1, "zep get");
   EXPECT_TRUE(document["sha256"].is_null());
   EXPECT_EQ(document["reason"], "Error performing command: The file does not exist; nothing arrived");
 }
@@ -591,7 +593,9 @@ TEST(ZepProxyCheckTest, PassesOnlyWhenThePageComesBack) {
   TProgramRun run = Zep("proxy-check zep:secret@" + shown);
   EXPECT_EQ(run.exitCode, kComplete);
   EXPECT_EQ(run.output, "The proxy " + shown + " lets requests through.\n");
-  EXPECT_EQ(nlohmann::json::parse(Zep("proxy-check --json zep:secret@" + shown).output)["works"], true);
+  auto const document = nlohmann::json::parse(Zep("proxy-check --json zep:secret@" + shown).output);
+  zep::ExpectEnvelope(document, kComplete, "zep proxy-check");
+  EXPECT_EQ(document["works"], true);
 
   run = Zep("proxy-check zep:topsecret@" + shown);
   EXPECT_EQ(run.exitCode, kNothing);

@@ -1,6 +1,7 @@
 // zep wpad, as users run it, beside real DHCP servers.
 
 #include "tests/system/wpad/WpadBed.h"
+#include "tests/tools/zep/Envelope.h"
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -42,10 +43,8 @@ TEST_F(ZepWpadTest, PrintsTheUrlAndWhatWasSentAndCameBack) {
 
 TEST_F(ZepWpadTest, PrintsJson) {
   nlohmann::json const document = Json("", "$ZEP wpad --yes --json");
-  EXPECT_EQ(document["document"], "zep wpad");
-  EXPECT_EQ(document["version"], 1);
+  zep::ExpectEnvelope(document, 0, "zep wpad");
   EXPECT_EQ(document["status"], "complete");
-  EXPECT_EQ(document["exitStatus"], 0);
   EXPECT_EQ(document["url"], "http://wpad.test/wpad.dat");
   EXPECT_EQ(document["stoppedClients"], true);
   EXPECT_EQ(document["messageBytes"], 1472);
@@ -128,6 +127,7 @@ TEST_F(ZepWpadTest, AnAnswerWithoutAUrl) {
                             "eth0              10.77.0.2         1 x 1472 bytes  300 bytes from 10.77.0.1\n"
                             "                                                    after N ms, without a URL\n");
   nlohmann::json const document = Json("WPAD_URL=-", "$ZEP wpad --no-stop --fetch --json");
+  zep::ExpectEnvelope(document, 1, "zep wpad");
   EXPECT_EQ(document["status"], "nothing");
   EXPECT_EQ(document["url"], nullptr);
   EXPECT_EQ(document["interfaces"][0]["reply"]["url"], nullptr);
@@ -241,6 +241,7 @@ TEST_F(ZepWpadTest, SaysWhyThereIsNoFile) {
     EXPECT_EQ(run.status, 2);
     EXPECT_EQ(run.errors, std::string("zep: the file was not fetched: ") + row.failure + "\n");
     auto const document = nlohmann::json::parse(run.output);
+    zep::ExpectEnvelope(document, 2, "zep wpad");
     EXPECT_EQ(document["status"], "partial");
     EXPECT_EQ(document["file"], (nlohmann::json{{"text", nullptr}, {"failure", row.failure}}));
   }

@@ -79,7 +79,7 @@ TEST_F(ConfigTest, PrintsJson) {
   TRun const run = Run({"--json"});
   EXPECT_EQ(run.status, 0);
   auto const document = JsonOf(run);
-  EXPECT_EQ(document["version"], 1);
+  EXPECT_EQ(document["version"], 2);
   EXPECT_EQ(document["file"], File());
   EXPECT_EQ(document["settings"], nlohmann::json::parse(R"([{"key": "a", "value": "1", "line": 1},
                                                             {"key": "flag", "value": "flag", "line": 3}])"));

@@ -1,5 +1,6 @@
 // zep remote without a controller: how it is called, where the password comes from, what it prints.
 
+#include "tests/tools/zep/Envelope.h"
 #include "tests/tools/zep/Zep.h"
 #include "tools/zep/Controller.h"
 
@@ -16,17 +17,25 @@ using testing::HasSubstr;
 
 std::string const kSaid = "1234\0AB7\0KQ12345\0\0"s;
 
+std::string WithoutHead(TJson document) {
+  for (char const* member : {"document", "version", "zep", "sample", "exitStatus", "reason"}) document.erase(member);
+  return document.dump();
+}
+
 TEST(RemoteIdentityTextTest, PutsTogetherWhatTheProcessSaid) {
   TRemoteIdentity const whole = IdentityFrom("h", kSaid, true);
   EXPECT_TRUE(IsComplete(whole));
   EXPECT_FALSE(IsNothing(whole));
-  EXPECT_EQ(AsJson(whole).dump(), R"({"host":"h","type":"1234","model":"AB7","serialNumber":"KQ12345"})");
+  ExpectEnvelope(AsJson(whole).dump(), 0, "zep remote");
+  EXPECT_EQ(WithoutHead(AsJson(whole)), R"({"host":"h","type":"1234","model":"AB7","serialNumber":"KQ12345"})");
   EXPECT_EQ(AsText(whole), "Remote server    h\nMachine type     1234\nModel            AB7\nSerial number    KQ12345\n");
 
   TRemoteIdentity const part = IdentityFrom("h", "1234\0\0\0why\0"s, true);
   EXPECT_FALSE(IsComplete(part));
   EXPECT_FALSE(IsNothing(part));
-  EXPECT_EQ(AsJson(part).dump(), R"({"host":"h","type":"1234","model":null,"serialNumber":null,"error":"why"})");
+  ExpectEnvelope(AsJson(part).dump(), 2, "zep remote");
+  EXPECT_EQ(AsJson(part)["reason"], "why");
+  EXPECT_EQ(WithoutHead(AsJson(part)), R"({"host":"h","type":"1234","model":null,"serialNumber":null,"error":"why"})");
   EXPECT_EQ(AsText(part), "Remote server    h\nMachine type     1234\nModel            unknown\nSerial number    unknown\n");
 }
 

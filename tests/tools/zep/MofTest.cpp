@@ -235,7 +235,7 @@ TEST_F(MofTest, AFailureIsADocumentToo) {
     EXPECT_EQ(run.status, 1);
     EXPECT_EQ(run.errors, "zep: " + why + "\n");
     EXPECT_EQ(JsonOf(run), (nlohmann::json{{"document", "zep " + call.front()},
-                                           {"version", 1},
+                                           {"version", 2},
                                            {"zep", TEST_VERSION},
                                            {"sample", false},
                                            {"exitStatus", 1},

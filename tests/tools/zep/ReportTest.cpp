@@ -332,7 +332,7 @@ TEST_F(ReportTest, JsonAgreesWithTheText) {
     EXPECT_EQ(json.status, text.status);
     EXPECT_EQ(json.errors, "");
     auto const document = JsonOf(json);
-    EXPECT_EQ(document["version"], 1);
+    EXPECT_EQ(document["version"], 2);
     EXPECT_EQ(document["document"], "zep report");
     EXPECT_EQ(document["sample"], false);
     EXPECT_EQ(document["exitStatus"], text.status);

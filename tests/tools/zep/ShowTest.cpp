@@ -156,7 +156,7 @@ TEST_F(ShowTest, WhatIsNotThereIsADocumentToo) {
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: no provider has the object \"X_None\"\n");
   EXPECT_EQ(JsonOf(run)["document"], "zep show");
-  EXPECT_EQ(JsonOf(run)["version"], 1);
+  EXPECT_EQ(JsonOf(run)["version"], 2);
   EXPECT_EQ(JsonOf(run)["exitStatus"], 1);
   EXPECT_EQ(JsonOf(run)["reason"], "no provider has the object \"X_None\"");
 }
@@ -167,7 +167,7 @@ TEST_F(ShowTest, TheSampleIsLabelled) {
   auto const document = JsonOf(Run({"show", "--sample", "--json", "CIM_Chassis"}));
   EXPECT_EQ(document["sample"], true);
   EXPECT_EQ(document["label"], "SAMPLE");
-  EXPECT_EQ(document["version"], 1);
+  EXPECT_EQ(document["version"], 2);
 }
 
 }  // namespace

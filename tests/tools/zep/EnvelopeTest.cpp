@@ -1,0 +1,231 @@
+// The exit status and the JSON document of every command of zep, where it succeeds and where it fails.
+
+#include "tests/tools/zep/Envelope.h"
+#include "tests/tools/zep/Zep.h"
+
+#include <gmock/gmock.h>
+
+#include <set>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+// A call with --json, and what it ends with.
+struct TRow {
+  std::string document;
+  int status;
+  std::vector<std::string> arguments;
+};
+
+class EnvelopeTest : public testing::Test {
+protected:
+  EnvelopeTest() {
+    fs::create_directory(zep_.Path("work"));
+    fs::create_directory(zep_.Path("empty"));
+    Write("zep.cfg", "a=1\n");
+    Write("good.mof", "class X_A { uint32 A; };\n");
+    Write("bad.mof", "class\n");
+    Write("there", "");
+    Write("hosts", "one\ntwo\n");
+  }
+
+  void Write(std::string const& name, std::string const& text) { WriteFile(zep_.Path("work/" + name), text); }
+
+  TRun Run(std::vector<std::string> const& arguments, std::string const& directory = "work") {
+    TCall call = {arguments};
+    call.environment = {{"ZEP_SMBIOS_TABLE", "/nowhere"}, {"HOME", "/nowhere"}, {"NETRC", "/dev/null"}};
+    call.directory = zep_.Path(directory);
+    call.hasNoTerminal = true;
+    return zep_.Run(call);
+  }
+
+  void Expect(TRow const& row) {
+    SCOPED_TRACE(testing::PrintToString(row.arguments));
+    TRun const run = Run(row.arguments);
+    EXPECT_EQ(run.status, row.status) << run.errors;
+    ExpectEnvelope(run.output, run.status, row.document);
+  }
+
+  // The names below "Subcommands:", each after that of the command that they belong to.
+  std::vector<std::string> NamesIn(std::vector<std::string> const& command) {
+    std::vector<std::string> arguments = command;
+    arguments.push_back("--help");
+    std::string const help = Run(arguments).output;
+    std::string const title = "Subcommands:\n";
+    std::size_t const start = help.find(title);
+    if (start == help.npos) return {};
+    std::vector<std::string> names;
+    for (std::string const& line : LinesOf(help.substr(start + title.size()))) {
+      if (line.empty()) break;
+      if (line.compare(0, 2, "  ") == 0 && line.compare(0, 3, "   ") != 0) names.push_back(line.substr(2, line.find(' ', 2) - 2));
+    }
+    return names;
+  }
+
+  // "zep media mount" and so on, as zep --help lists them.
+  std::set<std::string> Commands() {
+    std::set<std::string> commands;
+    for (std::string const& name : NamesIn({})) {
+      commands.insert("zep " + name);
+      for (std::string const& below : NamesIn({name})) commands.insert("zep " + name + " " + below);
+    }
+    return commands;
+  }
+
+  // The command that the words name, of those.
+  static std::string CommandOf(std::set<std::string> const& commands, std::vector<std::string> const& arguments) {
+    std::string command = "zep";
+    for (std::string const& argument : arguments)
+      if (commands.count(command + " " + argument) > 0) command += " " + argument;
+    return command;
+  }
+
+  // Which commands have no row and are not among the others either.
+  template <class TRows>
+  std::set<std::string> Missing(TRows const& rows, std::set<std::string> const& others) {
+    std::set<std::string> const commands = Commands();
+    EXPECT_GT(commands.size(), 10u) << "zep --help is read wrongly";
+    std::set<std::string> missing = commands;
+    for (std::string const& other : others) missing.erase(other);
+    for (TRow const& row : rows) missing.erase(CommandOf(commands, row.arguments));
+    return missing;
+  }
+
+  TInstallation zep_;
+};
+
+// A command that is missing here makes the test fail.
+TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
+  TRow const rows[] = {
+      {"zep report", 68, {"report", "--json", "--sample", "--send", "ftp://127.0.0.1:1/d/"}},
+      {"zep report", 64, {"report", "--json", "--sample", "--send", "ftp://127.0.0.1:1/d/", "--netrc", "/nowhere"}},
+      {"zep report", 2, {"report", "--json"}},
+      {"zep report --to-media", 1, {"report", "--json", "--sample", "--to-media", "/dev/no-such-device"}},
+      {"zep show", 1, {"show", "X_None", "--json"}},
+      {"zep show", 1, {"show", "X_None", "--json", "--mof", "bad.mof"}},
+      {"zep classes", 1, {"classes", "--json", "--mof", "/nowhere"}},
+      {"zep mof", 1, {"mof", "--json", "bad.mof"}},
+      {"zep media", 1, {"media", "--json"}},
+      {"zep media", 1, {"media", "list", "--json"}},
+      {"zep media mount", 1, {"media", "mount", "--json", "/dev/no-such-device"}},
+      {"zep media mount", 64, {"media", "--json", "mount", "/etc/passwd"}},
+      {"zep media umount", 1, {"media", "umount", "--json", "/mnt/no-such-medium"}},
+      {"zep config", 1, {"config", "--json", "no-such-key"}},
+      {"zep remote", 1, {"remote", "--json", "192.0.2.1", "--user", "u"}},
+      {"zep remote", 1, {"remote", "--json", "192.0.2.1", "--user", "u", "--password-file", "/nowhere"}},
+      {"zep remote", 1, {"remote", "--json", "192.0.2.1", "--user", "u", "--password-file", "there"}},
+      {"zep remote", 1, {"remote", "--json", "192.0.2.1", "--user", "u", "--password-file", "zep.cfg"}},
+      {"zep remote", 1, {"remote", "--json", "--hosts", "/nowhere", "--user", "u"}},
+      {"zep remote", 64, {"remote", "--json", "--user", "u"}},
+      {"zep run", 1, {"run", "--json", "false"}},
+      {"zep run", 1, {"run", "--timeout", "5", "--json", "/nowhere/program", "--help"}},
+      {"zep send", 66, {"send", "--json", "/nowhere", "ftp://127.0.0.1:1/"}},
+      {"zep send", 68, {"send", "--json", "there", "ftp://127.0.0.1:1/"}},
+      {"zep send", 64, {"send", "--json", "there", "http://127.0.0.1:1/"}},
+      {"zep get", 73, {"get", "--json", "ftp://127.0.0.1:1/f", "there"}},
+      {"zep get", 73, {"get", "--json", "ftp://127.0.0.1:1/f", "/dev/null"}},
+      {"zep get", 68, {"get", "--json", "ftp://127.0.0.1:1/f", "new"}},
+      {"zep get", 64, {"get", "--json", "f", "new"}},
+      {"zep proxy-check", 68, {"proxy-check", "--json", "127.0.0.1:1"}},
+      {"zep proxy-check", 64, {"proxy-check", "--json", "127.0.0.1"}},
+      {"zep help", 64, {"help", "--json", "bogus"}},
+  };
+  for (TRow const& row : rows) Expect(row);
+  EXPECT_THAT(Missing(rows, {"zep wpad"}), testing::IsEmpty()) << "zep wpad has a test of its own, below";
+}
+
+// Not as root, who would begin to ask the network.
+TEST_F(EnvelopeTest, WpadThatMayNotListenPrintsADocument) {
+  TCall call = {{"wpad", "--json", "--no-stop"}};
+  call.asNobody = true;
+  TRun const run = zep_.Run(call);
+  EXPECT_EQ(run.status, 1);
+  ExpectEnvelope(run.output, 1, "zep wpad");
+}
+
+// The commands that are missing here need a server or a device: tests/system shows their documents.
+TEST_F(EnvelopeTest, EveryCommandThatSucceedsPrintsADocumentWithItsExitStatus) {
+  TRow const rows[] = {
+      {"zep report", 0, {"report", "--json", "--sample"}},
+      {"zep show", 0, {"show", "CIM_Chassis", "--json", "--sample"}},
+      {"zep show", 0, {"show", "X_A", "--json", "--mof", "good.mof"}},
+      {"zep classes", 0, {"classes", "--json", "--sample"}},
+      {"zep classes", 0, {"classes", "--json", "--tree", "--mof", "good.mof"}},
+      {"zep mof", 0, {"mof", "--json", "good.mof"}},
+      {"zep config", 0, {"config", "--json"}},
+      {"zep config", 0, {"config", "--json", "a"}},
+      {"zep run", 0, {"run", "--json", "echo", "--json=x"}},
+      {"zep help", 0, {"help", "--json"}},
+      {"zep help", 0, {"help", "--json", "media", "mount"}},
+  };
+  for (TRow const& row : rows) Expect(row);
+  std::set<std::string> const elsewhere = {"zep get",         "zep media",        "zep media list",
+                                           "zep media mount", "zep media umount", "zep proxy-check",
+                                           "zep remote",      "zep send",         "zep wpad"};
+  EXPECT_THAT(Missing(rows, elsewhere), testing::IsEmpty());
+}
+
+TEST_F(EnvelopeTest, WrongUsageOfEveryCommandPrintsADocument) {
+  for (std::string const& command : Commands()) {
+    std::vector<std::string> arguments;
+    std::istringstream words(command.substr(std::string("zep ").size()));
+    for (std::string word; words >> word;) arguments.push_back(word);
+    arguments.insert(arguments.end(), {"--json", "--no-such-option"});
+    Expect({command == "zep media list" ? "zep media" : command, 64, arguments});
+  }
+  TRow const rows[] = {
+      {"zep", 64, {"--json"}},
+      {"zep", 64, {"bogus", "--json"}},
+      {"zep remote", 64, {"remote", "h", "--user=", "--json"}},
+      {"zep remote", 64, {"remote", "h", "--user", "u", "--parallel", "x", "--json"}},
+      {"zep media", 64, {"media", "--json", "eject"}},
+      {"zep run", 64, {"run", "--json"}},
+  };
+  for (TRow const& row : rows) Expect(row);
+}
+
+TEST_F(EnvelopeTest, WithoutJsonOrBehindACommandToRunThereIsNoDocument) {
+  EXPECT_EQ(Run({"get", "ftp://127.0.0.1:1/f", "there"}).output, "");
+  EXPECT_EQ(Run({"run", "--no-such-option", "true", "--json"}).output, "");
+  EXPECT_EQ(Run({"run", "echo", "--json"}).output, "--json\n");
+  EXPECT_EQ(Run({"config", "--", "--json"}).output, "");
+}
+
+TEST_F(EnvelopeTest, EachHostOfAListHasADocumentOfItsOwnInALine) {
+  Write("password", "p\n");
+  TRun const run = Run({"remote", "--hosts", "hosts", "--user", "u", "--password-file", "password"});
+  EXPECT_EQ(run.status, 1);
+  ASSERT_EQ(LinesOf(run.output).size(), 2u);
+  for (std::string const& line : LinesOf(run.output)) ExpectEnvelope(line, 1, "zep remote");
+  TRun const failed = Run({"remote", "--json", "--hosts", "/nowhere", "--user", "u"});
+  ASSERT_EQ(LinesOf(failed.output).size(), 1u);
+}
+
+TEST_F(EnvelopeTest, AReportThatIsNotSentSaysSoAndWhereItIsKept) {
+  TCall call = {{"report", "--json", "--sample", "--send", "ftp://127.0.0.1:1/d/"}};
+  call.environment = {{"TMPDIR", zep_.Path("work")}, {"NETRC", "/dev/null"}};
+  TRun const run = zep_.Run(call);
+  EXPECT_EQ(run.status, 68);
+  auto const document = JsonOf(run);
+  EXPECT_EQ(document["status"], "complete");
+  EXPECT_THAT(document["reason"].get<std::string>(), testing::StartsWith("it was not sent: "));
+  EXPECT_THAT(document["sent"]["keptIn"].get<std::string>(), testing::StartsWith(zep_.Path("work/zep-report.")));
+  EXPECT_TRUE(fs::exists(document["sent"]["keptIn"].get<std::string>()));
+  EXPECT_TRUE(document["sent"]["sha256"].is_null());
+}
+
+TEST_F(EnvelopeTest, ADocumentThatCannotBeWrittenIsNotTriedTwice) {
+  TCall call = {{"config", "--json"}};
+  call.outputFile = "/dev/full";
+  TRun const run = zep_.Run(call);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors, "zep: standard output cannot be written: No space left on device\n");
+  call.arguments.push_back("--no-such-option");
+  TRun const wrong = zep_.Run(call);
+  EXPECT_EQ(wrong.status, 64);
+  EXPECT_EQ(wrong.errors,
+            "zep: there is no option --no-such-option\nzep: standard output cannot be written: No space left on device\n");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep
