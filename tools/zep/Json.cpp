@@ -77,12 +77,10 @@ TJson ValueAsJson(TCIMValue const& value) {
     case TType::kCIMTypeUint8:
     case TType::kCIMTypeUint16:
     case TType::kCIMTypeUint32:
-    case TType::kCIMTypeUint64:
       return std::stoull(value.ToString());
     case TType::kCIMTypeSint8:
     case TType::kCIMTypeSint16:
     case TType::kCIMTypeSint32:
-    case TType::kCIMTypeSint64:
       return std::stoll(value.ToString());
     case TType::kCIMTypeReal32:
       return RealAsJson(static_cast<float>(value), value.ToString());

@@ -25,8 +25,10 @@ TEST(JsonTest, ValuesBecomeTheirKindOfJson) {
       {TCIMValue(static_cast<short>(-5)), "-5"},
       {TCIMValue(4294967295u), "4294967295"},
       {TCIMValue(-1), "-1"},
-      {TCIMValue(std::numeric_limits<unsigned long>::max()), "18446744073709551615"},
-      {TCIMValue(std::numeric_limits<long>::min()), "-9223372036854775808"},
+      {TCIMValue(std::numeric_limits<unsigned long>::max()), "\"18446744073709551615\""},
+      {TCIMValue(7ul), "\"7\""},
+      {TCIMValue(-7l), "\"-7\""},
+      {TCIMValue(std::numeric_limits<long>::min()), "\"-9223372036854775808\""},
       {TCIMValue(0.5f), "0.5"},
       {TCIMValue(-2.25), "-2.25"},
       {TCIMValue(std::numeric_limits<double>::infinity()), "\"inf\""},
@@ -34,6 +36,7 @@ TEST(JsonTest, ValuesBecomeTheirKindOfJson) {
       {TCIMValue("7"), "\"7\""},
       {TCIMValue(TCIMDateTime("20070315143000.000000+060")), "\"20070315143000.000000+060\""},
       {TCIMValue(TType::kCIMTypeString, 0, elements), "[\"a\",null]"},
+      {TCIMValue(TType::kCIMTypeUint64, 0, std::vector<TCIMValue>{TCIMValue(7ul)}), "[\"7\"]"},
       {TCIMValue(TType::kCIMTypeString, 0, std::vector<TCIMValue>()), "[]"},
   };
   for (TRow const& row : rows) EXPECT_EQ(ValueAsJson(row.value).dump(), row.json);

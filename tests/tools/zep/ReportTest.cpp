@@ -617,8 +617,8 @@ TEST_F(ReportTest, OddValuesOfAProviderMakeOneValidDocument) {
     EXPECT_EQ(properties["Text"]["value"], "\x1b]0;title\x07 \xe2\x80\xae reversed");
     EXPECT_EQ(properties["Bytes"]["value"], "\xef\xbf\xbd\xef\xbf\xbd no UTF-8");
     EXPECT_EQ(properties["Flag"]["value"], true);
-    EXPECT_EQ(properties["Large"]["value"], 18446744073709551615u);
-    EXPECT_EQ(properties["Small"]["value"].dump(), "-9223372036854775808");
+    EXPECT_EQ(properties["Large"]["value"], "18446744073709551615");
+    EXPECT_EQ(properties["Small"]["value"], "-9223372036854775808");
     EXPECT_EQ(properties["Half"]["value"], 0.5);
     EXPECT_EQ(properties["Infinite"]["value"], "inf");
     EXPECT_EQ(properties["List"]["type"], "string[]");
