@@ -21,11 +21,12 @@ extern "C" {
 /* What the functions return: statuses of the core's list, under the core's numbers. */
 enum {
   kSmbiosOk = 0,
-  kSmbiosFail = 3, /* an argument that cannot be used; a file that cannot be read or holds no table */
+  kSmbiosFail = 3, /* an argument that cannot be used; a file that is not a regular one or holds no table */
   kSmbiosOutOfMemory = 4,
-  kSmbiosNoMoreItems = 5,   /* there is no structure of that type, or no further one */
-  kSmbiosFileNotFound = 26, /* the kernel exports no tables, or the named file is not there */
-  kSmbiosAccessDenied = 27  /* this user may not read the tables */
+  kSmbiosNoMoreItems = 5,      /* there is no structure of that type, or no further one */
+  kSmbiosFileSystemError = 11, /* the tables cannot be opened or read for another reason than the two below: errno has it */
+  kSmbiosFileNotFound = 26,    /* the kernel exports no tables, or the named file is not there */
+  kSmbiosAccessDenied = 27     /* this user may not read the tables */
 };
 
 /* Reads the tables and hands out a handle, null on failure. `provider` is not looked at and may be null. */

@@ -61,7 +61,8 @@ char const* TablePath() {
 int StatusOfOpenError(int error) {
   if (error == ENOENT || error == ENOTDIR) return kSmbiosFileNotFound;
   if (error == EACCES || error == EPERM) return kSmbiosAccessDenied;
-  return kSmbiosFail;
+  if (error == ENXIO) return kSmbiosFail;  // a socket, or a device that is not there
+  return kSmbiosFileSystemError;
 }
 
 // The file read last. It need not be read again while it is the same file with the same time of change.
@@ -119,9 +120,10 @@ int ReadTableFile(char const* path, TSharedTableFile& tableFile) {
 
   const TOpenFile file(path);
   if (file.Fd() < 0) return StatusOfOpenError(errno);
-  if (::fstat(file.Fd(), &status) != 0 || !S_ISREG(status.st_mode)) return kSmbiosFail;
+  if (::fstat(file.Fd(), &status) != 0) return kSmbiosFileSystemError;
+  if (!S_ISREG(status.st_mode)) return kSmbiosFail;
   const auto whole = std::make_shared<TTableFile>();
-  if (!ReadWhole(file.Fd(), static_cast<std::size_t>(status.st_size), whole->contents)) return kSmbiosFail;
+  if (!ReadWhole(file.Fd(), static_cast<std::size_t>(status.st_size), whole->contents)) return kSmbiosFileSystemError;
   whole->table = smbios::DmiTableIn(whole->contents);
   tableFile = whole;
   LastFile().Keep(status, tableFile);

@@ -5,7 +5,9 @@
 #include <dlfcn.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <cstdlib>
+#include <system_error>
 
 namespace NQRVZEP20 {
 
@@ -27,16 +29,23 @@ std::string TableFile() {
   return file != nullptr ? file : "";
 }
 
-TMissing WhyTablesFailed(int status, std::string const& tableFile) {
+// ": Too many open files", or an empty text where the library has left no reason.
+std::string Reason(int status, int error) {
+  return status == kSmbiosFileSystemError && error != 0 ? ": " + std::generic_category().message(error) : "";
+}
+
+// `error`: what the library left in errno.
+TMissing WhyTablesFailed(int status, int error, std::string const& tableFile) {
   if (!tableFile.empty()) {
     std::string const what = "the SMBIOS table file " + tableFile;
     if (status == kSmbiosFileNotFound) return {kMissingUnreadable, what + " does not exist"};
     if (status == kSmbiosAccessDenied) return {kMissingUnreadable, what + " may not be read by this user"};
+    if (status == kSmbiosFileSystemError) return {kMissingUnreadable, what + " cannot be read" + Reason(status, error)};
     return {kMissingUnreadable, what + " holds no SMBIOS table"};
   }
   if (status == kSmbiosFileNotFound) return {kMissingNoTables, "no SMBIOS tables exported"};
   if (status == kSmbiosAccessDenied) return {kMissingNeedsRoot, "needs root (SMBIOS tables)"};
-  return {kMissingUnreadable, "the system's SMBIOS tables cannot be read"};
+  return {kMissingUnreadable, "the system's SMBIOS tables cannot be read" + Reason(status, error)};
 }
 
 char const* NameOf(int type) {
@@ -94,9 +103,11 @@ struct TSmbiosReader::TLibrary {
       whyNot = {kMissingUnreadable, std::string(kLibraryName) + " lacks a function that it should have"};
       return nullptr;
     }
+    errno = 0;
     int const status = load(nullptr, &opened->tables);
+    int const error = errno;
     if (status != kSmbiosOk || opened->tables == nullptr) {
-      whyNot = WhyTablesFailed(status, tableFile);
+      whyNot = WhyTablesFailed(status, error, tableFile);
       return nullptr;
     }
     return opened;

@@ -7,10 +7,12 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 
 #include <atomic>
+#include <cerrno>
 #include <chrono>
 #include <cstring>
 #include <thread>
@@ -23,7 +25,8 @@ using testing::UnorderedElementsAre;
 
 static_assert(int{kSmbiosOk} == kZEPStatusOK && int{kSmbiosFail} == kZEPStatusFail &&
               int{kSmbiosOutOfMemory} == kZEPStatusOutOfMemory && int{kSmbiosNoMoreItems} == kZEPStatusNoMoreItems &&
-              int{kSmbiosFileNotFound} == kZEPStatusFileNotFound && int{kSmbiosAccessDenied} == kZEPStatusAccessDenied);
+              int{kSmbiosFileSystemError} == kZEPStatusFileSystemError && int{kSmbiosFileNotFound} == kZEPStatusFileNotFound &&
+              int{kSmbiosAccessDenied} == kZEPStatusAccessDenied);
 
 class SmbiosLibraryTest : public testing::Test {
 protected:
@@ -154,6 +157,21 @@ TEST_F(SmbiosLibraryTest, LoadSaysWhyItFails) {
   EXPECT_EQ(LoadStatusOfPath(dir_.Path("table/below a file")), kSmbiosFileNotFound);
   EXPECT_EQ(LoadStatusOfPath(dir_.Path()), kSmbiosFail) << "a directory";
   EXPECT_EQ(LoadStatusOfPath("/dev/zero"), kSmbiosFail) << "a device has no end";
+}
+
+TEST_F(SmbiosLibraryTest, LoadOfAFileThatCannotBeReadLeavesTheReasonInErrno) {
+  EXPECT_EQ(LoadStatusOfPath("/proc/self/mem"), kSmbiosFileSystemError) << "a read that fails";
+  EXPECT_EQ(errno, EIO);
+
+  WriteFile(dir_.Path("table"), RealTable("full"));
+  rlimit limit;
+  ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &limit), 0);
+  rlimit const none{0, limit.rlim_max};
+  ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &none), 0);
+  int const status = LoadStatusOfPath(dir_.Path("table")), error = errno;
+  ::setrlimit(RLIMIT_NOFILE, &limit);
+  EXPECT_EQ(status, kSmbiosFileSystemError) << "no descriptor left";
+  EXPECT_EQ(error, EMFILE);
 }
 
 TEST_F(SmbiosLibraryTest, LoadDoesNotWaitForAWriterOfAPipe) {

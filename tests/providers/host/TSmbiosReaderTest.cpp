@@ -5,6 +5,7 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <sys/resource.h>
 
 #include <memory>
 
@@ -89,6 +90,25 @@ TEST_F(TSmbiosReaderTest, ATableFileThatCannotBeReadSaysWhy) {
   EXPECT_EQ(reader_->WhyNone(1).fReason, "the SMBIOS table file " + dir_.Path("table") + " holds no SMBIOS table");
 }
 
+TEST_F(TSmbiosReaderTest, ATableFileThatCannotBeReadIsNotTakenForOneWithoutATable) {
+  ReadFrom("/proc/self/mem");
+  EXPECT_EQ(reader_->WhyNone(1).fCode, "unreadable");
+  EXPECT_EQ(reader_->WhyNone(1).fReason, "the SMBIOS table file /proc/self/mem cannot be read: Input/output error");
+
+  Read(EndOfTable());  // the library is loaded from now on
+  TSharedLibrary const library(::dlopen("libsmbios.so", RTLD_NOW));
+  ASSERT_TRUE(library) << ::dlerror();
+  WriteFile(dir_.Path("other"), EndOfTable());
+  rlimit limit;
+  ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &limit), 0);
+  rlimit const none{0, limit.rlim_max};
+  ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &none), 0);
+  ReadFrom(dir_.Path("other"));
+  ::setrlimit(RLIMIT_NOFILE, &limit);
+  EXPECT_EQ(reader_->WhyNone(1).fCode, "unreadable");
+  EXPECT_EQ(reader_->WhyNone(1).fReason, "the SMBIOS table file " + dir_.Path("other") + " cannot be read: Too many open files");
+}
+
 TEST_F(TSmbiosReaderTest, TheSourceTellsAFile) {
   Read(EndOfTable());
   EXPECT_EQ(reader_->SourceOf(17), "SMBIOS type 17 (file)");
@@ -138,6 +158,8 @@ TEST_F(FakeSmbiosTest, TheLibrarysStatusTellsWhy) {
       {"finds no file", "no-smbios", "no SMBIOS tables exported"},
       {"is denied access", "needs-root", "needs root (SMBIOS tables)"},
       {"fails", "unreadable", "the system's SMBIOS tables cannot be read"},
+      {"cannot read", "unreadable", "the system's SMBIOS tables cannot be read: Input/output error"},
+      {"cannot read and tells no reason", "unreadable", "the system's SMBIOS tables cannot be read"},
       {"hands out no handle", "unreadable", "the system's SMBIOS tables cannot be read"},
   };
   for (TRow const& row : rows) {

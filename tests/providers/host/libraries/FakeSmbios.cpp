@@ -3,6 +3,7 @@
 
 #include "platform/include/smbios.h"
 
+#include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <string>
@@ -42,6 +43,10 @@ int smBiosLoad(void*, void** handle) {
   if (Is("finds no file")) return kSmbiosFileNotFound;
   if (Is("is denied access")) return kSmbiosAccessDenied;
   if (Is("fails")) return kSmbiosFail;
+  if (Is("cannot read") || Is("cannot read and tells no reason")) {
+    errno = Is("cannot read") ? EIO : 0;
+    return kSmbiosFileSystemError;
+  }
   return kSmbiosOk;
 }
 
