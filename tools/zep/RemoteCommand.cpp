@@ -36,14 +36,16 @@ struct TArguments {
 
 // The lines of the file that are neither empty nor comments, without blanks around them.
 std::vector<std::string> HostsIn(std::string const& path) {
+  errno = 0;
   std::ifstream file(path);
-  if (!file) throw std::runtime_error(Printable(path) + " cannot be read");
   std::vector<std::string> hosts;
   for (std::string line; std::getline(file, line);) {
     std::size_t const first = line.find_first_not_of(" \t\r");
     if (first == line.npos || line[first] == '#') continue;
     hosts.push_back(line.substr(first, line.find_last_not_of(" \t\r") + 1 - first));
   }
+  bool const isRead = file.is_open() && !file.bad();  // to its end
+  if (!isRead) throw std::runtime_error(Printable(path) + " cannot be read: " + std::strerror(errno));
   if (hosts.empty()) throw std::runtime_error(Printable(path) + " names no host");
   return hosts;
 }

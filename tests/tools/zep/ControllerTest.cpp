@@ -125,8 +125,20 @@ TEST_F(ZepRemoteTest, AFileOfHostsThatCannotServeIsTold) {
   std::string const absent = zep_.Path("absent"), empty = File("empty", "\n# nothing\n \n");
   TRun const without = Run({"--hosts", absent, "--user", "u"}, password_);
   EXPECT_EQ(without.status, 1);
-  EXPECT_EQ(without.errors, "zep: " + absent + " cannot be read\n");
+  EXPECT_EQ(without.errors, "zep: " + absent + " cannot be read: No such file or directory\n");
   EXPECT_EQ(Run({"--hosts", empty, "--user", "u"}, password_).errors, "zep: " + empty + " names no host\n");
+}
+
+TEST_F(ZepRemoteTest, AFileOfHostsThatFailsWhileItIsReadIsNotTakenForItsEnd) {
+  struct TRow {
+    std::string path, reason;
+  };
+  for (TRow const& row : {TRow{zep_.Path("lib"), "Is a directory"}, TRow{"/proc/self/mem", "Input/output error"}}) {
+    TRun const run = Run({"--hosts", row.path, "--user", "u"}, password_);
+    EXPECT_EQ(run.status, 1);
+    EXPECT_EQ(run.output, "");
+    EXPECT_EQ(run.errors, "zep: " + row.path + " cannot be read: " + row.reason + "\n");
+  }
 }
 
 TEST_F(ZepRemoteTest, WithoutATerminalThePasswordMustComeFromElsewhere) {
