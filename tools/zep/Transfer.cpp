@@ -93,7 +93,9 @@ bool IsSameFile(struct stat const& a, struct stat const& b) { return a.st_dev ==
 std::string WhyNotReadable(std::string const& file, struct stat& status) {
   if (::stat(file.c_str(), &status) != 0) return ReasonOf(errno);
   if (!S_ISREG(status.st_mode)) return "it is no regular file";
-  return ::access(file.c_str(), R_OK) == 0 ? "" : ReasonOf(errno);
+  TDescriptor const opened(::open(file.c_str(), O_RDONLY | O_CLOEXEC));
+  char first;
+  return opened && ::pread(opened.Get(), &first, 1, 0) >= 0 ? "" : ReasonOf(errno);
 }
 
 bool IsAsBefore(std::string const& file, struct stat const& before) {

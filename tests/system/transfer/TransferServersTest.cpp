@@ -75,6 +75,16 @@ TEST_P(FileServerTest, FilesGoThereAndBack) {
   EXPECT_EQ(OpenDescriptors(), descriptors);
 }
 
+// Both open for reading, and their first byte fails.
+TEST_P(FileServerTest, AnUploadOfWhatCannotBeReadIsAccessDenied) {
+  for (std::string const& file : {dir_.Path(), std::string("/proc/self/mem")}) {
+    SCOPED_TRACE(file);
+    ExpectFailure([&] { Put(Url("file"), file); }, kZEPStatusAccessDenied,
+                  {kPerforming + "the local file cannot be read to its end"});
+    EXPECT_EQ(fs::file_size(RemoteFile("file")), 0u) << "what was read until then";
+  }
+}
+
 TEST_P(FileServerTest, NamesAreThoseOfUrls) {
   std::string const file = LocalFile("text");
   Put(Url("a%20b%2Bc%25%23"), file);
@@ -85,13 +95,6 @@ TEST_P(FileServerTest, NamesAreThoseOfUrls) {
   if (IsFtp())
     ExpectFailure([&] { Put(Url("a%0d%0aDELE%20x"), file); }, kZEPStatusAccessDenied,
                   {kPerforming + "path contains control characters"});
-}
-
-// It opens for reading, and its first byte is its end already.
-TEST_P(FileServerTest, ADirectoryArrivesAsAnEmptyFile) {
-  Put(Url("file"), dir_.Path());
-  EXPECT_TRUE(fs::is_regular_file(RemoteFile("file")));
-  EXPECT_EQ(fs::file_size(RemoteFile("file")), 0u);
 }
 
 TEST_P(FileServerTest, MissingRemoteDirectoriesAreMade) {

@@ -376,6 +376,18 @@ TEST_F(ZepTransferTest, EachKindOfFailureHasItsStatus) {
             "69 Error opening curl library: libcurl.so.2: cannot open shared object file: No such file or directory\n");
 }
 
+TEST_F(ZepTransferTest, NothingIsSentOfWhatCannotBeRead) {
+  struct TRow {
+    std::string file, reason;
+  };
+  for (TRow const& row : {TRow{dir_.Path(), "it is no regular file"}, TRow{"/proc/self/mem", "Input/output error"}}) {
+    TProgramRun const run = Zep("send --as name " + row.file + " " + Url(""));
+    EXPECT_EQ(run.exitCode, kNoInput);
+    EXPECT_THAT(run.output, EndsWith("/name, " + row.file + ": " + row.reason + "\n"));
+  }
+  EXPECT_EQ(NamesIn(server_->Tree().Path()), std::vector<std::string>());
+}
+
 TEST_F(ZepTransferTest, AnAtSignInAPathIsNoPassword) {
   std::string const file = Local("f", "text");
   EXPECT_EQ(Zep("send " + file + " " + Url("a@b")).exitCode, kComplete) << "behind a user";
