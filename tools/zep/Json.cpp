@@ -5,6 +5,7 @@
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
 #include "Sample.h"
+#include "Text.h"
 #include "ValueWords.h"
 
 #include <cmath>
@@ -86,6 +87,8 @@ TJson ValueAsJson(TCIMValue const& value) {
       return RealAsJson(static_cast<float>(value), value.ToString());
     case TType::kCIMTypeReal64:
       return RealAsJson(static_cast<double>(value), value.ToString());
+    case TType::kCIMTypeReference:
+      return WithBytesEscaped(value.ToString());
     default:
       return value.ToString();
   }

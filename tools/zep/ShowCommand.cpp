@@ -45,13 +45,17 @@ std::string NamespaceOf(std::string const& path) {
   return end != std::string::npos && path[end] == ':' ? path.substr(0, end) : "";
 }
 
-// What has that path, from the text that zep itself prints of an instance: that of a key which is a reference is not to be read.
+// The instance of which zep prints that path, in a document or else on a terminal. Not every printed path can be read: that
+// of a key which is a reference stands raw, bytes that are no UTF-8 are escaped, and an instance without keys has a number.
 boost::shared_ptr<ICIMElement> FindPrinted(TNamespaceView const& view, std::string const& full) {
   std::string const path = full.substr(view.GetName().size() + 1);
-  std::size_t const dot = path.find('.');
-  if (dot == path.npos) return {};
-  for (auto const& instance : view.InstancesOf(path.substr(0, dot)))
+  std::size_t const endOfClass = path.find_first_of(".#");
+  if (endOfClass == path.npos) return {};
+  auto const instances = view.InstancesOf(path.substr(0, endOfClass));
+  for (auto const& instance : instances)
     if (view.PathOf(*instance) == full) return instance;
+  for (auto const& instance : instances)
+    if (Printable(view.PathOf(*instance)) == full) return instance;
   return {};
 }
 
@@ -71,7 +75,10 @@ boost::shared_ptr<ICIMElement> Find(TNamespaceView const& view, std::string cons
   if (!named.empty() && named != view.GetName()) return {};
   std::string const full = named.empty() ? view.GetName() + ":" + path : path;
   auto const element = FindRead(view, full);
-  return element ? element : FindPrinted(view, full);
+  auto const instance = boost::dynamic_pointer_cast<ICIMInstance const>(element);
+  bool const isExact = element && (!instance || view.PathOf(*instance) == full);
+  auto const printed = isExact ? nullptr : FindPrinted(view, full);
+  return printed ? printed : element;
 }
 
 std::string Heading(std::string const& what) {

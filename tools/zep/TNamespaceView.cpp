@@ -8,6 +8,9 @@
 #include "Sample.h"
 #include "TAddToVectorCallback.h"
 #include "TZEPException.h"
+#include "Text.h"
+
+#include <algorithm>
 
 namespace NQRVZEP20::zep {
 
@@ -21,6 +24,23 @@ std::string TextOf(ICIMInstance const& instance, std::string const& name) {
   if (!property) return "";
   TCIMValue const value = property->GetValue(TCIMContext());
   return value.IsNull() ? "" : value.ToString();
+}
+
+std::string PathIn(ICIMInstance const& instance) { return instance.GetPath(TCIMContext()).GetPath(); }
+
+// The path of an instance without any key value is the name of its class.
+bool HasKeys(std::string const& path) { return path.find('.') != std::string::npos; }
+
+bool HaveSameValues(ICIMInstance const& one, ICIMInstance const& other) {
+  bool areSame = true;
+  one.EnumerateProperties(
+      [&](boost::shared_ptr<ICIMProperty> property) {
+        auto const counterpart = other.GetProperty(property->GetName(TCIMContext()), TCIMContext());
+        areSame = counterpart && counterpart->GetValue(TCIMContext()) == property->GetValue(TCIMContext());
+        return areSame;
+      },
+      TCIMContext());
+  return areSame;
 }
 
 }  // namespace
@@ -62,7 +82,23 @@ TInstances TNamespaceView::AllInstances() const {
 }
 
 std::string TNamespaceView::PathOf(ICIMInstance const& instance) const {
-  return GetName() + ":" + instance.GetPath(TCIMContext()).GetPath();
+  std::string const path = PathIn(instance);
+  std::string const number = HasKeys(path) ? "" : "#" + std::to_string(NumberOf(instance, path));
+  return WithBytesEscaped(GetName() + ":" + path) + number;
+}
+
+// A provider may make a new object at each call: then the first one with the same values counts.
+std::size_t TNamespaceView::NumberOf(ICIMInstance const& instance, std::string const& className) const {
+  auto const [place, isNew] = fWithoutKeys.try_emplace(className);
+  TInstances& instances = place->second;
+  if (isNew)
+    for (auto const& candidate : InstancesOf(className))
+      if (PathIn(*candidate) == className) instances.push_back(candidate);
+
+  auto found = std::find_if(instances.begin(), instances.end(), [&](auto const& other) { return other.get() == &instance; });
+  if (found == instances.end())
+    found = std::find_if(instances.begin(), instances.end(), [&](auto const& other) { return HaveSameValues(*other, instance); });
+  return static_cast<std::size_t>(found - instances.begin()) + 1;
 }
 
 std::string TNamespaceView::SourceOf(ICIMPropertyDecl const& property) const {

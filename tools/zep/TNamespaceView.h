@@ -57,7 +57,10 @@ public:
   std::vector<boost::shared_ptr<ICIMInstance>> InstancesOf(std::string const& className) const;
   std::vector<boost::shared_ptr<ICIMInstance>> AllInstances() const;
 
-  // The object path with the namespace in front: "root/zep/host:CIM_Chassis.Tag=...".
+  // The object path with the namespace in front: "root/zep/host:CIM_Chassis.Tag=...". No two instances share it, and it is
+  // UTF-8 without zero bytes: other bytes are written as "\xff", which is no other path, as a path doubles the backslashes of its
+  // values. An instance without any key value has its number among those of its class, from 1, in place of keys:
+  // "root/x:X_Disk#2".
   std::string PathOf(ICIMInstance const& instance) const;
 
   std::string SourceOf(ICIMPropertyDecl const& property) const;
@@ -71,11 +74,15 @@ public:
   TAnswer AnswerWithoutInstance(std::string const& className, std::string const& property) const;
 
 private:
+  std::size_t NumberOf(ICIMInstance const& instance, std::string const& className) const;
   TMissing WhyMissing(std::string const& path, std::string const& property, TMissing const& otherwise) const;
 
   std::string fProviderName;
   boost::shared_ptr<ICIMNamespace> fNamespace;
   std::map<std::pair<std::string, std::string>, TMissing> fMissing;  // by path and property
+
+  // Instances without key values by class, of the classes that NumberOf was asked for.
+  mutable std::map<std::string, std::vector<boost::shared_ptr<ICIMInstance>>> fWithoutKeys;
 };
 
 }  // namespace NQRVZEP20::zep

@@ -46,6 +46,22 @@ std::string Escaped(std::uint32_t code) {
   return text;
 }
 
+// The text with those of its characters escaped that `isToBeEscaped`.
+template <class TIsToBeEscaped>
+std::string WithEscaped(std::string_view text, TIsToBeEscaped isToBeEscaped) {
+  std::string escaped;
+  while (!text.empty()) {
+    TCharacter const first = FirstOf(text);
+    std::size_t const size = std::max<std::size_t>(first.size, 1);
+    if (isToBeEscaped(first))
+      escaped += Escaped(first.code);
+    else
+      escaped += text.substr(0, size);
+    text.remove_prefix(size);
+  }
+  return escaped;
+}
+
 std::string WithoutTrailingBlanks(std::string_view text) { return std::string(text.substr(0, text.find_last_not_of(' ') + 1)); }
 
 // Where to break a text that is wider than `width`: behind that many characters, or at the last blank before.
@@ -61,17 +77,11 @@ std::size_t BreakOf(std::string_view text, std::size_t width) {
 }  // namespace
 
 std::string Printable(std::string_view text) {
-  std::string printable;
-  while (!text.empty()) {
-    TCharacter const first = FirstOf(text);
-    std::size_t const size = std::max<std::size_t>(first.size, 1);
-    if (first.size == 0 || IsHarmful(first.code))
-      printable += Escaped(first.code);
-    else
-      printable += text.substr(0, size);
-    text.remove_prefix(size);
-  }
-  return printable;
+  return WithEscaped(text, [](TCharacter const& character) { return character.size == 0 || IsHarmful(character.code); });
+}
+
+std::string WithBytesEscaped(std::string_view text) {
+  return WithEscaped(text, [](TCharacter const& character) { return character.size == 0 || character.code == 0; });
 }
 
 std::size_t WidthOf(std::string_view text) {

@@ -11,6 +11,10 @@ namespace NQRVZEP20::zep {
 // that change the direction of writing, and bytes that are no UTF-8 are written as "\x1b" or "\u202e".
 std::string Printable(std::string_view text);
 
+// The same text, with each zero byte and each byte that is no UTF-8 written as "\x00" or "\xff". Other characters stay, control
+// characters among them.
+std::string WithBytesEscaped(std::string_view text);
+
 // How many characters a printable text has. Each counts as one column.
 std::size_t WidthOf(std::string_view text);
 

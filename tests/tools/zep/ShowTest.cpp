@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <set>
 
 namespace NQRVZEP20::zep {
 namespace {
@@ -36,6 +37,50 @@ TEST_F(ShowTest, EveryPathThatOneRunPrintsAnotherOneShows) {
     if (run.status != 0) continue;
     EXPECT_EQ(JsonOf(run)["object"], instance);
   }
+}
+
+TEST_F(ShowTest, EveryPathIsOfOneObjectAndShowsIt) {
+  auto const instances = JsonOf(Run({"report", "--json"}, "hard-to-name"))["instances"];
+  std::set<std::string> paths;
+  for (auto const& instance : instances) {
+    paths.insert(instance["path"]);
+    TRun const run = Run({"show", instance["path"], "--json"}, "hard-to-name");
+    EXPECT_EQ(run.status, 0) << instance["path"] << run.errors;
+    if (run.status != 0) continue;
+    EXPECT_EQ(JsonOf(run)["object"], instance);
+  }
+  EXPECT_EQ(paths.size(), instances.size());
+  for (char const* path : {"root/test:X_Note#1", "root/test:X_Note#2", "root/test:X_LateNote#1", "root/test:X_Plain#1",
+                           "root/test:X_Bytes.Id=\"\\xff\"", "root/test:X_Bytes.Id=\"\\xfe\"", "root/test:X_Bytes.Id=\"\\\\xff\"",
+                           "root/test:X_Bytes.Id=\"\xef\xbf\xbd\""})
+    EXPECT_THAT(paths, testing::Contains(path));
+}
+
+TEST_F(ShowTest, EveryPathInAListOfInstancesShowsIt) {
+  for (std::string const name : {"X_Note", "X_LateNote", "X_Plain", "X_Bytes", "X_ToBytes"}) {
+    std::string const text = Run({"show", name}, "hard-to-name").output;
+    auto const lines = LinesOf(text.substr(text.find("\nInstances\n") + 11));
+    auto const listed = JsonOf(Run({"show", name, "--json"}, "hard-to-name"))["object"]["instances"];
+    ASSERT_EQ(lines.size(), listed.size());
+    for (std::size_t at = 0; at < lines.size(); ++at)
+      EXPECT_EQ(JsonOf(Run({"show", lines[at], "--json"}, "hard-to-name"))["object"]["path"], listed[at]) << lines[at];
+  }
+}
+
+TEST_F(ShowTest, AnInstanceWithoutKeysHasANumberAndItsClassTheName) {
+  EXPECT_THAT(Run({"show", "X_Note#2"}, "hard-to-name").output,
+              testing::AllOf(testing::StartsWith("root/test:X_Note#2\n\n"), HasSubstr("second\n")));
+  EXPECT_THAT(Run({"show", "X_Note"}, "hard-to-name").output,
+              testing::EndsWith("\nInstances\nroot/test:X_Note#1\nroot/test:X_Note.Id=\"1\"\nroot/test:X_Note#2\n"
+                                "root/test:X_LateNote#1\n"));
+  for (std::string const path : {"X_Note#3", "X_Note#0", "X_Note#", "X_Note#x", "X_LateNote#2", "X_None#1", "#1"})
+    EXPECT_EQ(Run({"show", path}, "hard-to-name").status, 1) << path;
+}
+
+TEST_F(ShowTest, AReferenceIsShownAsAPathThatIsFound) {
+  auto const object = JsonOf(Run({"show", "X_ToBytes.Id=\"1\"", "--json"}, "hard-to-name"))["object"];
+  EXPECT_EQ(object["properties"]["Target"]["value"], "X_Bytes.Id=\"\\xfd\"");
+  EXPECT_EQ(Run({"show", object["properties"]["Target"]["value"]}, "hard-to-name").status, 0);
 }
 
 TEST_F(ShowTest, AnObjectIsShownWithTypesAndValues) {

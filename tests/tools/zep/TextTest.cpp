@@ -44,6 +44,11 @@ TEST(TextTest, WhatATerminalWouldActUponIsEscaped) {
   for (TRow const& row : rows) EXPECT_EQ(Printable(row.text), row.printable) << testing::PrintToString(row.text);
 }
 
+TEST(TextTest, OnlyBytesThatNoArgumentOrDocumentCanHoldAreEscaped) {
+  EXPECT_EQ(WithBytesEscaped("caf\xc3\xa9 \x1b\n\xc2\x9b\xe2\x80\xae"), "caf\xc3\xa9 \x1b\n\xc2\x9b\xe2\x80\xae");
+  EXPECT_EQ(WithBytesEscaped(std::string("a\0b\xff\xc3", 5)), "a\\x00b\\xff\\xc3");
+}
+
 TEST(TextTest, EveryByteBecomesPrintable) {
   for (int byte = 0; byte < 256; ++byte) {
     std::string const text = Printable(std::string(1, static_cast<char>(byte)));

@@ -72,6 +72,25 @@ void AddOddities(TMemoryNamespace& ns) {
   ns.AddInstance("X_Link", {{"Id", "1"}, {"Target", odd->GetReference()}});
 }
 
+// Instances whose paths do not tell them from the class, or hold bytes that are no UTF-8.
+void AddHardToName(TMemoryNamespace& ns) {
+  ns.DefineClass("X_Note").Key("Id", "string").Property("Text", "string");
+  ns.DefineClass("X_LateNote", "X_Note");
+  ns.DefineClass("X_Plain").Property("Text", "string");
+  ns.AddInstance("X_Note", {{"Text", "first"}});
+  ns.AddInstance("X_Note", {{"Id", "1"}, {"Text", "with a key"}});
+  ns.AddInstance("X_LateNote", {{"Text", "of a class below"}});
+  ns.AddInstance("X_Note", {{"Text", "second"}});
+  ns.AddInstance("X_Plain", {{"Text", "plain"}});
+
+  ns.DefineClass("X_Bytes").Key("Id", "string").Property("Text", "string");
+  ns.DefineClass("X_ToBytes").Key("Id", "string").Reference("Target", "X_Bytes");
+  for (char const* id : {"\xff", "\xfe", "\\xff", "\xef\xbf\xbd", "\xc3\xa9 \xc3", "\x1b \xff\""})
+    ns.AddInstance("X_Bytes", {{"Id", id}, {"Text", "text of " + std::string(id)}});
+  ns.AddInstance("X_Bytes", {{"Id", std::string("a\0b", 3)}});
+  ns.AddInstance("X_ToBytes", {{"Id", "1"}, {"Target", ns.AddInstance("X_Bytes", {{"Id", "\xfd"}})->GetReference()}});
+}
+
 void AddRefused(TMemoryNamespace& ns) {
   ns.DefineClass("X_Refused").Key("Id", "string").Property("Kind", "uint16");
   ns.AddInstance("X_Refused", {{"Id", "1"}, {"Kind", "no number"}});
@@ -83,6 +102,7 @@ void Fill(TMemoryNamespace& ns) {
   if (Does("throws-a-number")) throw 5;
   if (Does("two-systems") || Does("one-system")) AddSystems(ns);
   if (Does("is-refused")) AddRefused(ns);
+  if (Does("hard-to-name")) AddHardToName(ns);
   if (Does("odd")) AddOddities(ns);
 }
 
