@@ -5,9 +5,17 @@
  * The IPMI client library, libipmiClient.so. The core loads it at run time by OpenConnection, SendIpmiCommand and
  * CloseConnection and never links it.
  *
- * It holds at most one session, which belongs to the whole process: use it from one thread at a time. Every call blocks
- * until the controller has answered or has been silent for about 5 s; a command may then take as long again to open the
- * session anew, for a controller that has forgotten it is as silent.
+ * It holds at most one session, which belongs to the whole process: use it from one thread at a time.
+ *
+ * Answers may take 3 s, and packets may be lost, doubled and overtaken by others on the way. A request that gets no answer is
+ * sent again: the first query of all every 0.5 s, the other steps of opening a session every second, a command every 3.5 s,
+ * or a second later than the first query was answered if that is more. Every call blocks until it is done:
+ *
+ *   OpenConnection   as long as the system looks for the host's address; then at most 60 s. A silent host is given up after
+ *                    7 s, one that says that nobody listens at once
+ *   SendIpmiCommand  at most 30 s; a silent controller is given up after 21 s. Where the session is opened anew before, the
+ *                    times of CloseConnection and OpenConnection as well
+ *   CloseConnection  at most 1.5 s
  */
 
 #ifdef __cplusplus
@@ -19,16 +27,16 @@ enum {
   kIpmiClientOk = 0,
   kIpmiClientWrongPassword = 1,
   kIpmiClientUnknownUser = 2,     /* or one that is disabled */
-  kIpmiClientNoAnswer = 3,        /* the controller is silent, or nobody listens */
+  kIpmiClientNoAnswer = 3,        /* the controller is silent, or nobody listens; see SendIpmiCommand */
   kIpmiClientHostUnknown = 4,     /* the host name has no address */
   kIpmiClientUnreachable = 5,     /* the system cannot send there */
   kIpmiClientBusy = 6,            /* the controller has no session left */
   kIpmiClientRefused = 7,         /* the account may not be administrator, or no cipher suite is in common */
-  kIpmiClientBadArgument = 8,     /* an argument that cannot be used; a user name or password that is too long */
+  kIpmiClientBadArgument = 8,     /* an argument that cannot be used; a user name, password or request that is too long */
   kIpmiClientNoSession = 9,       /* nothing is open */
   kIpmiClientCompletionCode = 10, /* the controller answered that it did not carry the command out */
   kIpmiClientOutOfMemory = 11,
-  kIpmiClientFail = 12 /* anything else, such as answers that make no sense */
+  kIpmiClientFail = 12 /* anything else, such as answers that make no sense: the caller's own packets, say */
 };
 
 enum {
@@ -46,8 +54,16 @@ int OpenConnection(int mode, const char* host, const char* port, const char* use
 /*
  * Sends one command to the controller and waits for its answer. `response`: at least kIpmiClientResponseSize bytes;
  * `responseLength` comes back as the number of bytes written there, the answer's data without the completion code. When
- * the controller refuses the command, `completionCode` says why and kIpmiClientCompletionCode is returned. A session
- * that has expired meanwhile is opened again once, and the command sent again.
+ * the controller refuses the command, `completionCode` says why and kIpmiClientCompletionCode is returned.
+ *
+ * A command that is refused because the session lacks the privilege is sent once more after the privilege was asked for
+ * again; with some controllers a late copy of a packet takes it away.
+ *
+ * A session without an answer for 20 s is opened anew before the command is sent, for controllers close idle ones. While no
+ * answer comes the command is sent again within the session and with the same request number, by which the controller can
+ * tell that it is the same one; it is never sent in a second session. When the call ends without an answer
+ * (kIpmiClientNoAnswer) or with kIpmiClientFail, the controller may or may not have carried the command out; the session is
+ * given up, and the next command opens another.
  */
 int SendIpmiCommand(unsigned char command, const unsigned char* request, int requestLength, unsigned char* response,
                     unsigned short* responseLength, unsigned char* completionCode, unsigned char netFn);

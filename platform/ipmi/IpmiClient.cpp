@@ -2,9 +2,10 @@
 
 #include "platform/include/ipmiClient.h"
 
+#include "platform/ipmi/Failure.h"
 #include "platform/ipmi/TSession.h"
 
-#include <cstring>
+#include <algorithm>
 #include <new>
 #include <optional>
 
@@ -27,10 +28,13 @@ int OpenConnection(int mode, char const* host, char const* port, char const* use
   if (mode != kIpmiClientLan || !host || !port || !user || !password) return kIpmiClientBadArgument;
   if (*host == '\0') return kIpmiClientHostUnknown;
   Session().emplace(ipmi::TTarget{host, port, user, password});
-  const int result = Session()->Open();
-  if (result != kIpmiClientOk) CloseConnection();
-  return result;
+  Session()->Open();
+  return kIpmiClientOk;
+} catch (ipmi::TFailure const& failure) {
+  Session().reset();
+  return failure.status;
 } catch (std::bad_alloc const&) {
+  Session().reset();
   return kIpmiClientOutOfMemory;
 }
 
@@ -41,13 +45,14 @@ int SendIpmiCommand(unsigned char command, unsigned char const* request, int req
   *responseLength = 0;
   if (!Session()) return kIpmiClientNoSession;
 
-  ipmi::TAnswer answer;
-  const int result = Session()->Send(netFn, command, {request, static_cast<std::size_t>(requestLength)}, answer);
-  if (result != kIpmiClientOk) return result;
-  *completionCode = answer.completionCode;
-  *responseLength = static_cast<unsigned short>(answer.length);
-  std::memcpy(response, answer.data.data(), answer.length);
-  return answer.completionCode == 0 ? kIpmiClientOk : kIpmiClientCompletionCode;
+  const ipmi::TReply reply = Session()->Send(netFn, command, ipmi::TByteVector(request, request + requestLength));
+  if (reply.data.size() > kIpmiClientResponseSize) return kIpmiClientFail;
+  *completionCode = reply.completionCode;
+  *responseLength = static_cast<unsigned short>(reply.data.size());
+  std::copy(reply.data.begin(), reply.data.end(), response);
+  return reply.completionCode == 0 ? kIpmiClientOk : kIpmiClientCompletionCode;
+} catch (ipmi::TFailure const& failure) {
+  return failure.status;
 } catch (std::bad_alloc const&) {
   return kIpmiClientOutOfMemory;
 }

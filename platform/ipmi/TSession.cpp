@@ -1,160 +1,126 @@
 #include "platform/ipmi/TSession.h"
 
-#include <freeipmi/freeipmi.h>
-#include <string.h>
+#include "platform/include/ipmiClient.h"
+#include "platform/ipmi/Failure.h"
 
 #include <algorithm>
-#include <new>
+#include <exception>
 
 namespace ipmi {
 namespace {
 
-// A controller that stays silent is given up about a second after the session's time-out. The same time-out ends a session
-// in which nothing is asked; it is then opened again.
-constexpr unsigned kSessionTimeoutMilliseconds = 4000;
-constexpr unsigned kRetransmissionMilliseconds = 500;
+constexpr std::size_t kMaxUserLength = 16, kMaxPasswordLength = 20;
 
-// How a session is opened.
-struct TWay {
-  enum EVersion { kVersion2, kVersion15 } version;
-  std::uint8_t cipherSuite;
-  unsigned workarounds;
-};
-
-// Some controllers name no privilege when a session of version 2.0 is opened. Nothing is lost with the others: a privilege
-// that cannot be had shows one step later. A session given up half open would take up room in the controller.
-constexpr unsigned kNoPrivilegeNamed = IPMI_WORKAROUND_FLAGS_OUTOFBAND_2_0_OPEN_SESSION_PRIVILEGE;
-
+// Some controllers refuse a session of version 2.0 for which a privilege is named, and some one for which none is.
 constexpr TWay kWays[] = {
-    {TWay::kVersion2, 3, kNoPrivilegeNamed},  {TWay::kVersion2, 3, 0},  //
-    {TWay::kVersion2, 17, kNoPrivilegeNamed}, {TWay::kVersion2, 17, 0}, {TWay::kVersion15, 0, 0},
+    {TWay::kVersion2, 3, false},  {TWay::kVersion2, 3, true},  //
+    {TWay::kVersion2, 17, false}, {TWay::kVersion2, 17, true}, {TWay::kVersion15, 0, true},
 };
 constexpr int kNumberOfWays = sizeof kWays / sizeof *kWays;
-
-bool HasNoVersion2(int error) { return error == IPMI_ERR_IPMI_2_0_UNAVAILABLE; }
-
-bool HasNoSuchCipherSuite(int error) { return error == IPMI_ERR_CIPHER_SUITE_ID_UNAVAILABLE || error == IPMI_ERR_IPMI_ERROR; }
+constexpr int kMostAttempts = 3;  // to open a session in one way
 
 // The next way that may do after one failed, or kNumberOfWays. Silence and a refused account end the same way however the
-// session is opened, and a wrong password costs the whole time-out with version 1.5.
-int WayBehind(int way, int error) {
+// session is opened.
+int WayAfter(int way, TFailure::ECause cause) {
   TWay const& failed = kWays[way];
   const auto isWorthTrying = [&](TWay const& next) {
     if (failed.version == TWay::kVersion15) return false;
-    if (HasNoVersion2(error)) return next.version == TWay::kVersion15;
-    if (HasNoSuchCipherSuite(error)) return next.cipherSuite != failed.cipherSuite;
-    if (error == IPMI_ERR_PRIVILEGE_LEVEL_CANNOT_BE_OBTAINED)
-      return next.cipherSuite == failed.cipherSuite && next.workarounds != failed.workarounds;
+    if (cause == TFailure::kNoVersion2) return next.version == TWay::kVersion15;
+    if (cause == TFailure::kNoSuchCipherSuite) return next.cipherSuite != failed.cipherSuite;
+    if (cause == TFailure::kNoSuchPrivilege)
+      return next.cipherSuite == failed.cipherSuite && next.namesPrivilege != failed.namesPrivilege;
     return false;
   };
   return static_cast<int>(std::find_if(kWays + way + 1, kWays + kNumberOfWays, isWorthTrying) - kWays);
 }
 
-int StatusOf(int error) {
-  switch (error) {
-    case IPMI_ERR_SUCCESS:
-      return kIpmiClientOk;
-    case IPMI_ERR_PASSWORD_INVALID:
-    case IPMI_ERR_PASSWORD_VERIFICATION_TIMEOUT:
-      return kIpmiClientWrongPassword;
-    case IPMI_ERR_USERNAME_INVALID:
-      return kIpmiClientUnknownUser;
-    case IPMI_ERR_CONNECTION_TIMEOUT:
-    case IPMI_ERR_SESSION_TIMEOUT:
-      return kIpmiClientNoAnswer;
-    case IPMI_ERR_HOSTNAME_INVALID:
-      return kIpmiClientHostUnknown;
-    case IPMI_ERR_SYSTEM_ERROR:
-      return kIpmiClientUnreachable;
-    case IPMI_ERR_BMC_BUSY:
-      return kIpmiClientBusy;
-    case IPMI_ERR_PRIVILEGE_LEVEL_INSUFFICIENT:
-    case IPMI_ERR_PRIVILEGE_LEVEL_CANNOT_BE_OBTAINED:
-    case IPMI_ERR_AUTHENTICATION_TYPE_UNAVAILABLE:
-    case IPMI_ERR_CIPHER_SUITE_ID_UNAVAILABLE:
-    case IPMI_ERR_IPMI_2_0_UNAVAILABLE:
-      return kIpmiClientRefused;
-    case IPMI_ERR_PARAMETERS:
-      return kIpmiClientBadArgument;
-    case IPMI_ERR_OUT_OF_MEMORY:
-      return kIpmiClientOutOfMemory;
-    default:
-      return kIpmiClientFail;
-  }
-}
-
-// Host and port as libfreeipmi takes them; an IPv6 address needs brackets.
-std::string HostAndPort(TTarget const& target) {
-  const bool isBareVersion6 = target.host.find(':') != std::string::npos && target.host.front() != '[';
-  return (isBareVersion6 ? "[" + target.host + "]" : target.host) + ":" + target.port;
-}
-
-int Open(ipmi_ctx_t context, TTarget const& target, TWay const& way) {
-  const std::string host = HostAndPort(target);
-  if (way.version == TWay::kVersion15)
-    return ipmi_ctx_open_outofband(context, host.c_str(), target.user.c_str(), target.password.c_str(),
-                                   IPMI_AUTHENTICATION_TYPE_MD5, IPMI_PRIVILEGE_LEVEL_ADMIN, kSessionTimeoutMilliseconds,
-                                   kRetransmissionMilliseconds, IPMI_WORKAROUND_FLAGS_DEFAULT, IPMI_FLAGS_DEFAULT);
-  return ipmi_ctx_open_outofband_2_0(context, host.c_str(), target.user.c_str(), target.password.c_str(), nullptr, 0,
-                                     IPMI_PRIVILEGE_LEVEL_ADMIN, way.cipherSuite, kSessionTimeoutMilliseconds,
-                                     kRetransmissionMilliseconds, way.workarounds, IPMI_FLAGS_DEFAULT);
+// Opens the session; a copy of a packet may make another attempt necessary.
+std::unique_ptr<IEnvelope> OpenInStep(TOpening const& opening, TWay const& way) {
+  for (int attempt = 1;; ++attempt) try {
+      return OpenSession(opening, way);
+    } catch (TFailure const& failure) {
+      if (failure.cause != TFailure::kOutOfStep || attempt == kMostAttempts) throw;
+    }
 }
 
 }  // namespace
 
-TTarget::~TTarget() { ::explicit_bzero(password.data(), password.size()); }
-
-void TSession::TContextCloser::operator()(ipmi_ctx* context) const noexcept {
-  ipmi_ctx_close(context);
-  ipmi_ctx_destroy(context);
+TSession::TSession(TTarget target, TTimes const& times) : fTarget(std::move(target)), fTimes(times) {
+  if (fTarget.user.size() > kMaxUserLength || fTarget.password.size() > kMaxPasswordLength)
+    throw TFailure{kIpmiClientBadArgument};
 }
 
-TSession::TSession(TTarget target) : fTarget(std::move(target)) {}
+TSession::~TSession() { Close(); }
 
-int TSession::TryToOpen(int way) {
-  fContext.reset(ipmi_ctx_create());
-  if (!fContext) throw std::bad_alloc();
-  if (ipmi::Open(fContext.get(), fTarget, kWays[way]) == 0) return IPMI_ERR_SUCCESS;
-  const int error = ipmi_ctx_errnum(fContext.get());
-  fContext.reset();
-  return error != IPMI_ERR_SUCCESS ? error : static_cast<int>(IPMI_ERR_INTERNAL_ERROR);
+TWaits TSession::Lengthened(TWaits const& waits) const {
+  TWaits lengthened = waits;
+  for (auto& wait : lengthened) wait = std::max(wait, fContactTime + fTimes.beyondContact);
+  return lengthened;
 }
 
-int TSession::Open() {
-  int error = IPMI_ERR_INTERNAL_ERROR;
-  for (int way = fWayThatWorked; way < kNumberOfWays; way = WayBehind(way, error)) {
-    error = TryToOpen(way);
-    if (error == IPMI_ERR_SUCCESS) {
-      fWayThatWorked = way;
-      break;
+// Finds the address at which the host's controller listens.
+TContact TSession::Reach(TClock::time_point deadline) {
+  const std::vector<TAddress> addresses = AddressesOf(fTarget.host, fTarget.port);
+  for (std::size_t n = 0;; ++n) try {
+      fLink = std::make_unique<TLink>(addresses[n]);
+      return MakeContact(*fLink, fTimes.contact, deadline);
+    } catch (TFailure const& failure) {
+      const bool isDeadEnd = failure.status == kIpmiClientUnreachable || fLink->NobodyListens();
+      if (!isDeadEnd || n + 1 == addresses.size()) throw;
     }
-  }
-  return StatusOf(error);
 }
 
-int TSession::Send(unsigned char netFn, unsigned char command, TBytes request, TAnswer& answer) {
-  std::vector<unsigned char> message = {command};
-  message.insert(message.end(), request.data, request.data + request.size);
-  int error = TryToSend(netFn, message, answer);
-  if (error == IPMI_ERR_SESSION_TIMEOUT) {
-    if (const int status = Open(); status != kIpmiClientOk) return status;
-    error = TryToSend(netFn, message, answer);
-  }
-  return StatusOf(error);
+void TSession::Open() {
+  const TClock::time_point deadline = TClock::now() + fTimes.wholeOpening;
+  fEnvelope.reset();
+  const TContact contact = Reach(deadline);
+  fContactTime = contact.answerTime;
+  const TOpening opening = {*fLink, fTarget, contact, Lengthened(fTimes.step), deadline};
+  for (int way = fWayThatWorked;;) try {
+      fEnvelope = OpenInStep(opening, kWays[way]);
+      RaisePrivilege(*fLink, *fEnvelope, opening.waits, deadline);
+      fWayThatWorked = way;
+      fLastAnswer = TClock::now();
+      return;
+    } catch (TFailure const& failure) {
+      Close();
+      way = WayAfter(way, failure.cause);
+      if (way == kNumberOfWays) throw;
+    }
 }
 
-int TSession::TryToSend(unsigned char netFn, std::vector<unsigned char> const& message, TAnswer& answer) {
-  if (!fContext) return IPMI_ERR_SESSION_TIMEOUT;  // it expired, and could not be opened again
-  constexpr std::size_t kBeforeData = 2;           // the command and the completion code
-  std::array<unsigned char, kBeforeData + kIpmiClientResponseSize> response;
-  const int length = ipmi_cmd_raw(fContext.get(), 0, netFn, message.data(), static_cast<unsigned>(message.size()),
-                                  response.data(), static_cast<unsigned>(response.size()));
-  if (length < 0) return ipmi_ctx_errnum(fContext.get());
-  if (length < static_cast<int>(kBeforeData)) return IPMI_ERR_INTERNAL_ERROR;
-  answer.completionCode = response[1];
-  answer.length = static_cast<std::size_t>(length) - kBeforeData;
-  std::copy_n(response.begin() + kBeforeData, answer.length, answer.data.begin());
-  return IPMI_ERR_SUCCESS;
+TReply TSession::Send(unsigned char netFn, unsigned char command, TByteVector const& request) try {
+  if (fEnvelope && IsIdle()) Close();
+  if (!fEnvelope) Open();
+  const TClock::time_point deadline = TClock::now() + fTimes.wholeCommand;
+  const TReply reply = AskInSession(netFn, command, request, deadline);
+  if (reply.completionCode != IPMI_COMP_CODE_INSUFFICIENT_PRIVILEGE_LEVEL) return reply;
+
+  // It was not carried out. A late copy of a packet that opened the session takes the privilege away with some controllers.
+  RaisePrivilege(*fLink, *fEnvelope, Lengthened(fTimes.step), deadline);
+  return AskInSession(netFn, command, request, deadline);
+} catch (TFailure const& failure) {
+  if (failure.status != kIpmiClientBadArgument) fEnvelope.reset();
+  throw;
+}
+
+TReply TSession::AskInSession(unsigned char netFn, unsigned char command, TByteVector const& request,
+                              TClock::time_point deadline) {
+  const TMessage message = {netFn, fLink->NextSequence(), command, request};
+  const TReply reply = Ask(*fLink, *fEnvelope, message, Lengthened(fTimes.command), deadline);
+  fLastAnswer = TClock::now();
+  return reply;
+}
+
+// A controller that does not answer closes the session by itself after a while.
+void TSession::Close() noexcept try {
+  if (!fEnvelope) return;
+  const std::unique_ptr<IEnvelope> envelope = std::move(fEnvelope);
+  TFields request(tmpl_cmd_close_session_rq);
+  Checked(::fill_cmd_close_session(envelope->SessionId(), nullptr, request.Object()));
+  Ask(*fLink, *envelope, MessageOf(IPMI_NET_FN_APP_RQ, fLink->NextSequence(), request), fTimes.close, TClock::time_point::max());
+} catch (TFailure const&) {
+} catch (std::exception const&) {
 }
 
 }  // namespace ipmi

@@ -1,61 +1,53 @@
 #pragma once
 
-#include "platform/include/ipmiClient.h"
-
-#include <array>
-#include <cstddef>
-#include <memory>
-#include <string>
-#include <vector>
-
-struct ipmi_ctx;
+#include "platform/ipmi/Opening.h"
 
 namespace ipmi {
 
-// Longer requests fit no message over the LAN.
-constexpr int kMaxRequestLength = 255;
+// How long is waited for what, in milliseconds. The defaults hold for the library; ipmiClient.h says what callers get of them.
+struct TTimes {
+  // The first query of all changes nothing: it is sent often, and its answer awaited for long.
+  TWaits contact = {kOften, kOften, kOften, kOften, kOften, kOften, kOften, kLong};
 
-// Which controller, and as whom. The password is wiped at the end.
-struct TTarget {
-  std::string host, port, user, password;
+  // The later waits also last a second longer than the answer to the first query took.
+  std::chrono::milliseconds beyondContact{1000};
+  TWaits step = TWaits(8, std::chrono::milliseconds(0));  // of the opening
+  TWaits command = TWaits(6, kLong);                      // a slow controller must not get it twice
+  TWaits close = TWaits(3, kOften);
 
-  ~TTarget();
+  std::chrono::milliseconds wholeOpening{60000}, wholeCommand{30000};
+  std::chrono::milliseconds idle{20000};  // well before a controller closes a session by itself
+
+  static constexpr std::chrono::milliseconds kOften{500}, kLong{3500};
 };
 
-struct TBytes {
-  unsigned char const* data;
-  std::size_t size;
-};
-
-struct TAnswer {
-  unsigned char completionCode;
-  std::size_t length;  // of the data
-  std::array<unsigned char, kIpmiClientResponseSize> data;
-};
-
-// A session with a controller, as administrator. Closed when it goes out of scope. What its functions return is of the list
-// in ipmiClient.h.
+// A session with a controller, as administrator. Closed when it goes out of scope. Its functions throw TFailure.
 class TSession {
 public:
-  explicit TSession(TTarget target);
+  explicit TSession(TTarget target, TTimes const& times = {});
+  ~TSession();
+  TSession(TSession const&) = delete;
+  TSession& operator=(TSession const&) = delete;
 
-  int Open();
+  void Open();
 
-  // Sends a command and waits for its answer. A session that has expired is opened again once.
-  int Send(unsigned char netFn, unsigned char command, TBytes request, TAnswer& answer);
+  // Sends a command and waits for its answer. A session that was idle is opened anew before; one that was lost too. When no
+  // answer comes the session is lost, and whether the controller carried the command out is not known.
+  TReply Send(unsigned char netFn, unsigned char command, TByteVector const& request);
 
 private:
-  struct TContextCloser {
-    void operator()(ipmi_ctx* context) const noexcept;
-  };
-  using TContext = std::unique_ptr<ipmi_ctx, TContextCloser>;
+  bool IsIdle() const { return TClock::now() - fLastAnswer > fTimes.idle; }
+  TWaits Lengthened(TWaits const& waits) const;
+  TContact Reach(TClock::time_point deadline);
+  TReply AskInSession(unsigned char netFn, unsigned char command, TByteVector const& request, TClock::time_point deadline);
+  void Close() noexcept;
 
-  // Both return an error number of libfreeipmi, 0 for success. A context that failed to open cannot be used again.
-  int TryToOpen(int way);
-  int TryToSend(unsigned char netFn, std::vector<unsigned char> const& message, TAnswer& answer);
-
-  TTarget fTarget;
-  TContext fContext;       // null: not open
+  TTarget const fTarget;
+  TTimes const fTimes;
+  std::unique_ptr<TLink> fLink;
+  std::unique_ptr<IEnvelope> fEnvelope;  // null: there is no session
+  std::chrono::milliseconds fContactTime{0};
+  TClock::time_point fLastAnswer;
   int fWayThatWorked = 0;  // an index of kWays
 };
 

@@ -40,6 +40,14 @@ std::string Receive(int fd, sockaddr_in* from) {
   return datagram;
 }
 
+TUniqueFd BoundSocket(int port) {
+  TUniqueFd socket(::socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0));
+  sockaddr_in const address = Loopback(port);
+  if (::bind(socket.get(), reinterpret_cast<sockaddr const*>(&address), sizeof address) != 0)
+    throw std::runtime_error("port in use");
+  return socket;
+}
+
 }  // namespace
 
 bool HasIpmiBed() { return IsOnPath("ipmi_sim") && CanMakeNetworks(); }
@@ -97,10 +105,7 @@ void TSimulator::GoOn() const { ::kill(fSimulator, SIGCONT); }
 
 // ---- Peers that misbehave ----
 
-TUdpPeer::TUdpPeer(int port, TAnswer answer) : fSocket(::socket(AF_INET, SOCK_DGRAM, 0)), fAnswer(std::move(answer)) {
-  sockaddr_in const address = Loopback(port);
-  if (::bind(fSocket.get(), reinterpret_cast<sockaddr const*>(&address), sizeof address) != 0)
-    throw std::runtime_error("port in use");
+TUdpPeer::TUdpPeer(int port, TAnswer answer) : fSocket(BoundSocket(port)), fAnswer(std::move(answer)) {
   fThread = std::thread([this] { Run(); });
 }
 
@@ -120,6 +125,56 @@ void TUdpPeer::Run() {
   }
 }
 
+struct TRelay::TWaiting {
+  bool isAnswer;
+  std::string bytes;
+};
+
+TRelay::TRelay(int port, int controllersPort, TRule rule)
+    : fClients(BoundSocket(port)), fController(::socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0)), fRule(std::move(rule)) {
+  sockaddr_in const controller = Loopback(controllersPort);
+  ::connect(fController.get(), reinterpret_cast<sockaddr const*>(&controller), sizeof controller);
+  fThread = std::thread([this] { Run(); });
+}
+
+TRelay::~TRelay() {
+  fEnds = true;
+  fThread.join();
+}
+
+std::vector<std::string> TRelay::Requests() const {
+  std::lock_guard const lock(fMutex);
+  return fRequests;
+}
+
+void TRelay::Run() {
+  while (!fEnds) {
+    for (bool const isAnswer : {false, true})
+      if (IsReadable((isAnswer ? fController : fClients).get(), 1)) Take(isAnswer);
+    while (!fWaiting.empty() && fWaiting.begin()->first <= std::chrono::steady_clock::now())
+      PassOn(fWaiting.extract(fWaiting.begin()).mapped());
+  }
+}
+
+void TRelay::Take(bool isAnswer) {
+  TDatagram datagram = {isAnswer, fPlaces[isAnswer]++,
+                        Receive((isAnswer ? fController : fClients).get(), isAnswer ? nullptr : &fClient)};
+  if (!isAnswer) {
+    std::lock_guard const lock(fMutex);
+    fRequests.push_back(datagram.bytes);
+  }
+  for (auto const delay : fRule(datagram))
+    fWaiting.emplace(std::chrono::steady_clock::now() + delay, TWaiting{isAnswer, datagram.bytes});
+}
+
+void TRelay::PassOn(TWaiting const& waiting) {
+  if (waiting.isAnswer)
+    ::sendto(fClients.get(), waiting.bytes.data(), waiting.bytes.size(), 0, reinterpret_cast<sockaddr*>(&fClient),
+             sizeof fClient);
+  else
+    ::send(fController.get(), waiting.bytes.data(), waiting.bytes.size(), 0);
+}
+
 std::optional<std::string> AskOf(int port, std::string const& datagram) {
   // One source address for all that is asked, as a session has.
   static TUniqueFd const socket(::socket(AF_INET, SOCK_DGRAM, 0));
@@ -128,6 +183,19 @@ std::optional<std::string> AskOf(int port, std::string const& datagram) {
   ::sendto(socket.get(), datagram.data(), datagram.size(), 0, reinterpret_cast<sockaddr const*>(&address), sizeof address);
   if (!IsReadable(socket.get(), 300)) return std::nullopt;
   return Receive(socket.get(), nullptr);
+}
+
+std::string WithoutVersion2(std::string answer) {
+  constexpr std::size_t kAuthenticationTypeInHeader = 4, kMessage = 14, kCommand = 19, kTypes = 22, kExtended = 24;
+  bool const isCapabilities = answer.size() >= 30 && answer[kAuthenticationTypeInHeader] == 0 && answer[kCommand] == 0x38;
+  if (!isCapabilities) return answer;
+  answer[kTypes] = static_cast<char>(answer[kTypes] & 0x7F);
+  answer[kExtended] = 0;
+  unsigned char sum = 0;
+  for (std::size_t place = kMessage; place + 1 < answer.size(); ++place)
+    sum = static_cast<unsigned char>(sum + static_cast<unsigned char>(answer[place]));
+  answer.back() = static_cast<char>(-sum);
+  return answer;
 }
 
 // ---- The platform library ----
@@ -155,6 +223,22 @@ TIpmiClientLibrary::TRead TIpmiClientLibrary::ReadFru(unsigned offset, unsigned 
   read.completionCode = completionCode;
   read.data.assign(reinterpret_cast<char const*>(response), length);
   return read;
+}
+
+int TIpmiClientLibrary::AddEvent() const {
+  unsigned char const entry[16] = {0, 0, 2, 0, 0, 0, 0, 0x41, 0, 4, 1, 1, 0x6F, 1, 2, 3};
+  unsigned char response[kIpmiClientResponseSize];
+  unsigned short length = 0;
+  unsigned char completionCode = 0xFF;
+  return send(0x44, entry, sizeof entry, response, &length, &completionCode, 0x0A);
+}
+
+int TIpmiClientLibrary::Events() const {
+  unsigned char response[kIpmiClientResponseSize];
+  unsigned short length = 0;
+  unsigned char completionCode = 0xFF;
+  bool const isTold = send(0x40, nullptr, 0, response, &length, &completionCode, 0x0A) == kIpmiClientOk && length > 2;
+  return isTold ? response[1] + 256 * response[2] : -1;
 }
 
 }  // namespace NQRVZEP20

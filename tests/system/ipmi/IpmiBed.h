@@ -7,7 +7,12 @@
 #include "platform/include/ipmiClient.h"
 #include "tests/Support.h"
 
+#include <netinet/in.h>
+
 #include <atomic>
+#include <chrono>
+#include <map>
+#include <mutex>
 #include <optional>
 
 namespace NQRVZEP20 {
@@ -72,8 +77,50 @@ private:
   std::thread fThread;
 };
 
+// A bad network between clients and a controller: passes the datagrams that come to a UDP port of 127.0.0.1 on to the
+// controller at another, and its answers back, as a rule says. On a thread of its own.
+class TRelay {
+public:
+  struct TDatagram {
+    bool isAnswer;
+    int place;  // among those of its direction, from 0
+    std::string bytes;
+  };
+  // After what delay each copy of a datagram is passed on; without any it is lost.
+  using TFate = std::vector<std::chrono::milliseconds>;
+  // May change the datagram's bytes.
+  using TRule = std::function<TFate(TDatagram&)>;
+
+  TRelay(int port, int controllersPort, TRule rule);
+  ~TRelay();
+
+  std::vector<std::string> Requests() const;  // all that came from clients, oldest first
+
+  static TFate AtOnce() { return {std::chrono::milliseconds(0)}; }
+
+private:
+  struct TWaiting;
+
+  void Run();
+  void Take(bool isAnswer);
+  void PassOn(TWaiting const& waiting);
+
+  TUniqueFd fClients, fController;
+  TRule fRule;
+  sockaddr_in fClient{};  // the latest
+  int fPlaces[2] = {0, 0};
+  std::multimap<std::chrono::steady_clock::time_point, TWaiting> fWaiting;
+  mutable std::mutex fMutex;
+  std::vector<std::string> fRequests;
+  std::atomic<bool> fEnds{false};
+  std::thread fThread;
+};
+
 // Sends a datagram on to the controller at 127.0.0.1 and that port and returns its answer.
 std::optional<std::string> AskOf(int port, std::string const& datagram);
+
+// Takes version 2.0 out of a controller's answer to Get Channel Authentication Capabilities; other packets stay as they are.
+std::string WithoutVersion2(std::string answer);
 
 // libipmiClient.so of the build, loaded as the core loads it.
 struct TIpmiClientLibrary {
@@ -93,6 +140,12 @@ struct TIpmiClientLibrary {
     std::string data;  // the count and what follows
   };
   TRead ReadFru(unsigned offset, unsigned char count, unsigned char device = 0) const;
+
+  // Adds an entry to the controller's event log; returns the library's result.
+  int AddEvent() const;
+
+  // How many entries the event log has; -1 when the controller does not tell.
+  int Events() const;
 };
 
 }  // namespace NQRVZEP20

@@ -1,0 +1,237 @@
+#include "platform/ipmi/Messages.h"
+
+#include "platform/include/ipmiClient.h"
+#include "platform/ipmi/Failure.h"
+
+#include <string.h>
+
+#include <algorithm>
+#include <initializer_list>
+
+namespace ipmi {
+namespace {
+
+constexpr std::size_t kLongestPacket = 512;
+constexpr std::size_t kMaxRequestLength15 = 248;
+constexpr unsigned kConfidentialityKeySize = 16;  // of AES-CBC-128; the key that is derived is longer
+
+// A command or its answer as it stands in a packet.
+fiid_field_t kMessageForm[] = {{8 * 1024, "message", FIID_FIELD_OPTIONAL | FIID_FIELD_LENGTH_VARIABLE}, {0, "", 0}};
+
+// The bytes of a packet where the kind of it can be seen.
+constexpr std::size_t kPayloadPlace = 5;
+constexpr unsigned char kPayloadType = 0x3F, kIsAuthenticated = 0x40, kIsEncrypted = 0x80;
+
+bool Is15(TPacket const& packet) { return ::ipmi_is_ipmi_1_5_packet(packet.data(), static_cast<unsigned>(packet.size())) == 1; }
+bool Is2(TPacket const& packet) { return ::ipmi_is_ipmi_2_0_packet(packet.data(), static_cast<unsigned>(packet.size())) == 1; }
+
+unsigned char PayloadByte(TPacket const& packet) { return packet.size() > kPayloadPlace ? packet[kPayloadPlace] : 0; }
+
+bool IsOfController(unsigned char payloadType) {
+  return payloadType == IPMI_PAYLOAD_TYPE_IPMI || payloadType == IPMI_PAYLOAD_TYPE_RMCPPLUS_OPEN_SESSION_RESPONSE ||
+         payloadType == IPMI_PAYLOAD_TYPE_RAKP_MESSAGE_2 || payloadType == IPMI_PAYLOAD_TYPE_RAKP_MESSAGE_4;
+}
+
+TByteVector Joined(std::initializer_list<unsigned char> head, TByteVector const& tail) {
+  TByteVector bytes(head.size() + tail.size());
+  std::copy(tail.begin(), tail.end(), std::copy(head.begin(), head.end(), bytes.begin()));
+  return bytes;
+}
+
+TFields RmcpHeader() {
+  TFields header(tmpl_rmcp_hdr);
+  Checked(::fill_rmcp_hdr_ipmi(header.Object()));
+  return header;
+}
+
+TFields MessageHeader(TMessage const& message) {
+  TFields header(tmpl_lan_msg_hdr_rq);
+  Checked(::fill_lan_msg_hdr(IPMI_SLAVE_ADDRESS_BMC, message.netFn, IPMI_BMC_IPMB_LUN_BMC, message.sequence, header.Object()));
+  return header;
+}
+
+TFields MessageBody(TMessage const& message) { return TFields(kMessageForm, Joined({message.command}, message.data)); }
+
+// The parts of a packet from the controller that a message is made of.
+struct TMessageParts {
+  TFields header{tmpl_lan_msg_hdr_rs}, body{kMessageForm}, trailer{tmpl_lan_msg_trlr};
+
+  // False when it is none of a controller, or was damaged on the way.
+  bool ReadReply(TReply& reply) const {
+    constexpr std::size_t kBeforeData = 2;  // the command and the completion code
+    const TByteVector bytes = body.Bytes();
+    if (bytes.size() < kBeforeData || ::ipmi_lan_check_checksum(header.Object(), body.Object(), trailer.Object()) != 1)
+      return false;
+    reply.netFn = static_cast<unsigned char>(header.Get("net_fn"));
+    reply.sequence = static_cast<unsigned char>(header.Get("rq_seq"));
+    reply.command = bytes[0];
+    reply.completionCode = bytes[1];
+    reply.data.assign(bytes.begin() + kBeforeData, bytes.end());
+    return reply.netFn % 2 == 1;  // a request has an even one
+  }
+};
+
+// Reading what a packet lacks is no failure of the caller's.
+template <class TRead>
+EVerdict NonsenseIfUnreadable(TRead const& read) try {
+  return read();
+} catch (TFailure const&) {
+  return EVerdict::kNonsense;
+}
+
+}  // namespace
+
+TMessage MessageOf(unsigned char netFn, unsigned char sequence, TFields const& request) {
+  const TByteVector bytes = request.Bytes();
+  return {netFn, sequence, bytes.at(0), TByteVector(bytes.begin() + 1, bytes.end())};
+}
+
+TFields FieldsOf(fiid_field_t* form, TReply const& reply) {
+  return TFields(form, Joined({reply.command, reply.completionCode}, reply.data));
+}
+
+bool IsAnswerTo(TMessage const& message, TReply const& reply) {
+  return reply.netFn == (message.netFn | 1) && reply.sequence == message.sequence && reply.command == message.command;
+}
+
+TReply Ask(TLink& link, IEnvelope& envelope, TMessage const& message, TWaits const& waits, TClock::time_point deadline) {
+  TReply reply;
+  const auto judge = [&](TPacket const& packet) {
+    const EVerdict verdict = envelope.Unpack(packet, reply);
+    return verdict == EVerdict::kAnswer && !IsAnswerTo(message, reply) ? EVerdict::kOther : verdict;
+  };
+  Exchange(link, {[&] { return envelope.Pack(message); }, judge}, waits, deadline);
+  envelope.Accept(reply);
+  return reply;
+}
+
+// ---- Version 1.5 ----
+
+TEnvelope15::TEnvelope15(TSession15 const& session, std::string const* password) : fSession(session), fPassword(password) {
+  fNewest = session.firstReply - 1;
+}
+
+TPacket TEnvelope15::Pack(TMessage const& message) {
+  if (message.data.size() > kMaxRequestLength15) throw TFailure{kIpmiClientBadArgument};
+  const TFields rmcp = RmcpHeader(), messageHeader = MessageHeader(message), body = MessageBody(message);
+  TFields header(tmpl_lan_session_hdr);
+  Checked(::fill_lan_session_hdr(fSession.authentication, fSession.nextPacket, fSession.id, header.Object()));
+  if (fSession.nextPacket != 0 && ++fSession.nextPacket == 0) ++fSession.nextPacket;  // 0 is for packets outside of a session
+  TPacket packet(kLongestPacket);
+  packet.resize(static_cast<std::size_t>(Checked(
+      ::assemble_ipmi_lan_pkt(rmcp.Object(), header.Object(), messageHeader.Object(), body.Object(),
+                              fPassword ? fPassword->data() : nullptr, static_cast<unsigned>(fPassword ? fPassword->size() : 0),
+                              packet.data(), static_cast<unsigned>(packet.size()), IPMI_INTERFACE_FLAGS_DEFAULT))));
+  return packet;
+}
+
+EVerdict TEnvelope15::Unpack(TPacket const& packet, TReply& reply) const {
+  if (!Is15(packet)) return EVerdict::kNonsense;
+  return NonsenseIfUnreadable([&] {
+    const TFields rmcp(tmpl_rmcp_hdr), header(tmpl_lan_session_hdr);
+    const TMessageParts parts;
+    const bool isWhole = Checked(::unassemble_ipmi_lan_pkt(packet.data(), static_cast<unsigned>(packet.size()), rmcp.Object(),
+                                                           header.Object(), parts.header.Object(), parts.body.Object(),
+                                                           parts.trailer.Object(), IPMI_INTERFACE_FLAGS_DEFAULT)) == 1;
+    if (!isWhole || !parts.ReadReply(reply)) return EVerdict::kNonsense;
+    reply.packet = static_cast<std::uint32_t>(header.Get("session_sequence_number"));
+    return IsOfSession(packet, header) ? EVerdict::kAnswer : EVerdict::kOther;
+  });
+}
+
+bool TEnvelope15::IsOfSession(TPacket const& packet, TFields const& header) const {
+  if (header.Get("session_id") != fSession.id || header.Get("authentication_type") != fSession.authentication) return false;
+  if (fSession.nextPacket != 0 && !IsNew(static_cast<std::uint32_t>(header.Get("session_sequence_number")))) return false;
+  if (fSession.authentication == IPMI_AUTHENTICATION_TYPE_NONE) return true;
+  return ::ipmi_lan_check_packet_session_authentication_code(packet.data(), static_cast<unsigned>(packet.size()),
+                                                             fSession.authentication, fPassword->data(),
+                                                             static_cast<unsigned>(fPassword->size())) == 1;
+}
+
+// ---- Version 2.0 ----
+
+TKeys::~TKeys() {
+  ::explicit_bzero(session.data(), session.size());
+  ::explicit_bzero(integrity.data(), integrity.size());
+  ::explicit_bzero(confidentiality.data(), confidentiality.size());
+}
+
+TEnvelope2::TEnvelope2(TCipherSuite const& suite, TKeys const& keys, std::uint32_t ownId, std::uint32_t controllersId)
+    : fSuite(suite), fKeys(keys), fOwnId(ownId), fControllersId(controllersId) {}
+
+TPacket TEnvelope2::Pack(TMessage const& message) {
+  const TFields rmcp = RmcpHeader(), messageHeader = MessageHeader(message), body = MessageBody(message);
+  TFields header(tmpl_rmcpplus_session_hdr), trailer(tmpl_rmcpplus_session_trlr);
+  Checked(::fill_rmcpplus_session_hdr(IPMI_PAYLOAD_TYPE_IPMI, IPMI_PAYLOAD_FLAG_AUTHENTICATED, IPMI_PAYLOAD_FLAG_ENCRYPTED, 0, 0,
+                                      fControllersId, fNextPacket, header.Object()));
+  Checked(::fill_rmcpplus_session_trlr(trailer.Object()));
+  if (++fNextPacket == 0) ++fNextPacket;  // 0 is for packets outside of a session
+  TPacket packet(kLongestPacket);
+  packet.resize(static_cast<std::size_t>(Checked(::assemble_ipmi_rmcpplus_pkt(
+      fSuite.authentication, fSuite.integrity, fSuite.confidentiality, fKeys.integrity.data(), fKeys.size,
+      fKeys.confidentiality.data(), kConfidentialityKeySize, nullptr, 0, rmcp.Object(), header.Object(), messageHeader.Object(),
+      body.Object(), trailer.Object(), packet.data(), static_cast<unsigned>(packet.size()), IPMI_INTERFACE_FLAGS_DEFAULT))));
+  return packet;
+}
+
+EVerdict TEnvelope2::Unpack(TPacket const& packet, TReply& reply) const {
+  if (Is15(packet)) return EVerdict::kOther;  // a late answer to the first query of all
+  if (!Is2(packet) || !IsOfController(PayloadByte(packet) & kPayloadType)) return EVerdict::kNonsense;
+  if (PayloadByte(packet) != (IPMI_PAYLOAD_TYPE_IPMI | kIsAuthenticated | kIsEncrypted)) return EVerdict::kOther;
+  return NonsenseIfUnreadable([&] {
+    const TFields rmcp(tmpl_rmcp_hdr), header(tmpl_rmcpplus_session_hdr), payload(tmpl_rmcpplus_payload);
+    const TFields trailer(tmpl_rmcpplus_session_trlr);
+    const TMessageParts parts;
+    const auto size = static_cast<unsigned>(packet.size());
+    const bool isWhole = Checked(::unassemble_ipmi_rmcpplus_pkt(
+                             fSuite.authentication, fSuite.integrity, fSuite.confidentiality, fKeys.integrity.data(), fKeys.size,
+                             fKeys.confidentiality.data(), kConfidentialityKeySize, packet.data(), size, rmcp.Object(),
+                             header.Object(), payload.Object(), parts.header.Object(), parts.body.Object(),
+                             parts.trailer.Object(), trailer.Object(), IPMI_INTERFACE_FLAGS_DEFAULT)) == 1;
+    const bool isGenuine =
+        isWhole && header.Get("session_id") == fOwnId &&
+        ::ipmi_rmcpplus_check_packet_session_authentication_code(fSuite.integrity, packet.data(), size, fKeys.integrity.data(),
+                                                                 fKeys.size, nullptr, 0, trailer.Object()) == 1;
+    if (!isGenuine || !parts.ReadReply(reply)) return EVerdict::kNonsense;
+    reply.packet = static_cast<std::uint32_t>(header.Get("session_sequence_number"));
+    return IsNew(reply.packet) ? EVerdict::kAnswer : EVerdict::kOther;
+  });
+}
+
+TPacket PackPayload(unsigned char type, TFields const& payload) {
+  const TFields rmcp = RmcpHeader();
+  TFields header(tmpl_rmcpplus_session_hdr), trailer(tmpl_rmcpplus_session_trlr);
+  Checked(::fill_rmcpplus_session_hdr(type, IPMI_PAYLOAD_FLAG_UNAUTHENTICATED, IPMI_PAYLOAD_FLAG_UNENCRYPTED, 0, 0, 0, 0,
+                                      header.Object()));
+  Checked(::fill_rmcpplus_session_trlr(trailer.Object()));
+  TPacket packet(kLongestPacket);
+  packet.resize(static_cast<std::size_t>(Checked(::assemble_ipmi_rmcpplus_pkt(
+      IPMI_AUTHENTICATION_ALGORITHM_RAKP_NONE, IPMI_INTEGRITY_ALGORITHM_NONE, IPMI_CONFIDENTIALITY_ALGORITHM_NONE, nullptr, 0,
+      nullptr, 0, nullptr, 0, rmcp.Object(), header.Object(), nullptr, payload.Object(), trailer.Object(), packet.data(),
+      static_cast<unsigned>(packet.size()), IPMI_INTERFACE_FLAGS_DEFAULT))));
+  return packet;
+}
+
+EVerdict UnpackPayload(TPacket const& packet, unsigned char type, TFields& payload) {
+  if (Is15(packet)) return EVerdict::kOther;  // a late answer to the first query of all
+  if (!Is2(packet) || !IsOfController(PayloadByte(packet) & kPayloadType)) return EVerdict::kNonsense;
+  if (PayloadByte(packet) != type) return EVerdict::kOther;
+  return NonsenseIfUnreadable([&] {
+    const TFields rmcp(tmpl_rmcp_hdr), header(tmpl_rmcpplus_session_hdr), bytes(tmpl_rmcpplus_payload);
+    const TFields trailer(tmpl_rmcpplus_session_trlr);
+    const TMessageParts unused;
+    const bool isWhole =
+        Checked(::unassemble_ipmi_rmcpplus_pkt(
+            IPMI_AUTHENTICATION_ALGORITHM_RAKP_NONE, IPMI_INTEGRITY_ALGORITHM_NONE, IPMI_CONFIDENTIALITY_ALGORITHM_NONE, nullptr,
+            0, nullptr, 0, packet.data(), static_cast<unsigned>(packet.size()), rmcp.Object(), header.Object(), bytes.Object(),
+            unused.header.Object(), payload.Object(), unused.trailer.Object(), trailer.Object(), IPMI_INTERFACE_FLAGS_DEFAULT)) ==
+        1;
+    return isWhole ? EVerdict::kAnswer : EVerdict::kNonsense;
+  });
+}
+
+bool IsEncryptedPayload(TPacket const& packet, unsigned char type) {
+  return Is2(packet) && PayloadByte(packet) == (type | kIsAuthenticated | kIsEncrypted);
+}
+
+}  // namespace ipmi

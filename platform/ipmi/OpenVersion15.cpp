@@ -1,0 +1,91 @@
+// Opening a session of version 1.5: the controller sends a challenge, which comes back signed with the password.
+
+#include "platform/include/ipmiClient.h"
+#include "platform/ipmi/Failure.h"
+#include "platform/ipmi/Opening.h"
+
+namespace ipmi {
+namespace {
+
+constexpr std::size_t kMaxPasswordLength = 16;
+constexpr unsigned char kAuthentication = IPMI_AUTHENTICATION_TYPE_MD5;
+
+TFields AskForChallenge(TOpening const& opening) {
+  TFields request(tmpl_cmd_get_session_challenge_rq);
+  Checked(::fill_cmd_get_session_challenge(kAuthentication, opening.target.user.data(),
+                                           static_cast<unsigned>(opening.target.user.size()), request.Object()));
+  TEnvelope15 noSession;
+  const TMessage message = MessageOf(IPMI_NET_FN_APP_RQ, opening.link.NextSequence(), request);
+  const TReply reply = Ask(opening.link, noSession, message, opening.waits, opening.deadline);
+  switch (reply.completionCode) {
+    case IPMI_COMP_CODE_COMMAND_SUCCESS:
+      return FieldsOf(tmpl_cmd_get_session_challenge_rs, reply);
+    case IPMI_COMP_CODE_GET_SESSION_CHALLENGE_INVALID_USERNAME:
+    case IPMI_COMP_CODE_GET_SESSION_CHALLENGE_NULL_USERNAME_NOT_ENABLED:
+      throw TFailure{kIpmiClientUnknownUser};
+    default:
+      throw TFailure{kIpmiClientFail};
+  }
+}
+
+void CheckActivation(unsigned char completionCode) {
+  switch (completionCode) {
+    case IPMI_COMP_CODE_COMMAND_SUCCESS:
+      return;
+    case IPMI_COMP_CODE_ACTIVATE_SESSION_NO_SESSION_SLOT_AVAILABLE:
+    case IPMI_COMP_CODE_ACTIVATE_SESSION_NO_SLOT_AVAILABLE_FOR_GIVEN_USER:
+    case IPMI_COMP_CODE_ACTIVATE_SESSION_NO_SLOT_AVAILABLE_TO_SUPPORT_USER:
+      throw TFailure{kIpmiClientBusy};
+    case IPMI_COMP_CODE_ACTIVATE_SESSION_EXCEEDS_PRIVILEGE_LEVEL:
+      throw TFailure{kIpmiClientRefused, TFailure::kNoSuchPrivilege};
+    case IPMI_COMP_CODE_ACTIVATE_SESSION_SESSION_SEQ_NUM_OUT_OF_RANGE:
+    case IPMI_COMP_CODE_ACTIVATE_SESSION_INVALID_SESSION_ID:
+      throw TFailure{kIpmiClientFail, TFailure::kOutOfStep};
+    default:
+      throw TFailure{kIpmiClientFail};
+  }
+}
+
+// A controller is silent to a wrong password.
+TReply AskSigned(TOpening const& opening, IEnvelope& envelope, TMessage const& message) try {
+  return Ask(opening.link, envelope, message, opening.waits, opening.deadline);
+} catch (TFailure const& failure) {
+  if (failure.status == kIpmiClientNoAnswer) throw TFailure{kIpmiClientWrongPassword};
+  throw;
+}
+
+TSession15 Activate(TOpening const& opening, TFields const& challenge) {
+  const TByteVector text = challenge.Data("challenge_string");
+  TSession15 session;
+  session.firstReply = RandomNumber();
+  session.authentication = kAuthentication;
+  session.id = static_cast<std::uint32_t>(challenge.Get("temp_session_id"));
+  TFields request(tmpl_cmd_activate_session_rq);
+  Checked(::fill_cmd_activate_session(kAuthentication, IPMI_PRIVILEGE_LEVEL_ADMIN, text.data(),
+                                      static_cast<unsigned>(text.size()), session.firstReply, request.Object()));
+  TEnvelope15 notYetOpen(session, &opening.target.password);
+  const TReply reply = AskSigned(opening, notYetOpen, MessageOf(IPMI_NET_FN_APP_RQ, opening.link.NextSequence(), request));
+  CheckActivation(reply.completionCode);
+
+  const TFields answer = FieldsOf(tmpl_cmd_activate_session_rs, reply);
+  session.id = static_cast<std::uint32_t>(answer.Get("session_id"));
+  session.nextPacket = static_cast<std::uint32_t>(answer.Get("initial_inbound_sequence_number"));
+  // Some controllers want a signature of this step only.
+  session.authentication = static_cast<unsigned char>(answer.Get("authentication_type"));
+  return session;
+}
+
+}  // namespace
+
+std::unique_ptr<IEnvelope> OpenVersion15(TOpening const& opening) {
+  if (opening.target.password.size() > kMaxPasswordLength) throw TFailure{kIpmiClientBadArgument};
+  const bool hasMd5 = opening.contact.capabilities.Get("authentication_type.md5") != 0;
+  if (!hasMd5) throw TFailure{kIpmiClientRefused};
+  const TFields challenge = AskForChallenge(opening);
+  const TSession15 session = Activate(opening, challenge);
+  const bool isSigned = session.authentication == kAuthentication;
+  if (!isSigned && session.authentication != IPMI_AUTHENTICATION_TYPE_NONE) throw TFailure{kIpmiClientFail};
+  return std::make_unique<TEnvelope15>(session, isSigned ? &opening.target.password : nullptr);
+}
+
+}  // namespace ipmi

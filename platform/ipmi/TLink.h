@@ -1,0 +1,80 @@
+#pragma once
+
+#include <netinet/in.h>
+#include <sys/socket.h>
+
+#include <chrono>
+#include <functional>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace ipmi {
+
+using TClock = std::chrono::steady_clock;
+using TPacket = std::vector<unsigned char>;
+
+struct TAddress {
+  sockaddr_storage address;
+  socklen_t size;
+};
+
+// The addresses of a host, one at least. Throws TFailure: kIpmiClientHostUnknown, or kIpmiClientBadArgument for a port that is
+// no number from 1 to 65535.
+std::vector<TAddress> AddressesOf(std::string const& host, std::string const& port);
+
+// A UDP socket that sends to one address. Packets are taken from any: a controller with several addresses may answer from another
+// one. Which of them is genuine is for the caller to see.
+class TLink {
+public:
+  // Throws TFailure{kIpmiClientUnreachable} when the system has no such addresses.
+  explicit TLink(TAddress const& address);
+  ~TLink();
+  TLink(TLink const&) = delete;
+  TLink& operator=(TLink const&) = delete;
+
+  // A packet that the network loses on the way is no failure. Throws TFailure{kIpmiClientUnreachable} when the system cannot
+  // send there.
+  void Send(TPacket const& packet);
+
+  // The next packet. Nothing when there is none until then, or as soon as NobodyListens. Longer ones than any controller
+  // sends come back empty.
+  std::optional<TPacket> Receive(TClock::time_point until);
+
+  // Whether the host said that nobody listens on the port, and no packet came before that.
+  bool NobodyListens() const { return fIsRefused && !fHasReceived; }
+
+  // The number of the next request, from 0 to 63 and over again.
+  unsigned char NextSequence() { return fSequence = (fSequence + 1) & 0x3F; }
+
+private:
+  void TakeErrors();
+
+  TAddress const fAddress;
+  int const fSocket;
+  bool fIsRefused = false;
+  bool fHasReceived = false;
+  unsigned char fSequence = 0;
+};
+
+// ---- A request and its answer over a network that delays, loses, doubles and reorders ----
+
+enum class EVerdict {
+  kAnswer,
+  kOther,    // of the controller, but no answer to this request: a copy, or one that is late
+  kNonsense  // nothing that a controller sends
+};
+
+// After each sending of the request: how long its answer is waited for, before it is sent once more.
+using TWaits = std::vector<std::chrono::milliseconds>;
+
+struct TExchange {
+  std::function<TPacket()> request;  // called for each sending
+  std::function<EVerdict(TPacket const&)> judge;
+};
+
+// Sends the request until `judge` finds its answer; packets that are none are passed over. Throws TFailure: kIpmiClientNoAnswer
+// when none came in all the time, or kIpmiClientFail when nonsense did.
+void Exchange(TLink& link, TExchange const& exchange, TWaits const& waits, TClock::time_point deadline);
+
+}  // namespace ipmi

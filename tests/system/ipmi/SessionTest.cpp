@@ -1,0 +1,113 @@
+// A session of libipmiClient.so's with other times than the library's.
+
+#include "platform/ipmi/TSession.h"
+
+#include "platform/ipmi/Failure.h"
+#include "tests/system/ipmi/IpmiBed.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20 {
+namespace {
+
+using namespace std::chrono_literals;
+using testing::ElementsAre;
+
+constexpr int kControllersPort = 6240;
+constexpr unsigned char kStorage = 0x0A, kAddEvent = 0x44, kEventLogInfo = 0x40;
+
+class SessionTest : public testing::Test {
+protected:
+  void SetUp() override {
+    NEEDS(HasIpmiBed(), kIpmiBedNeeds);
+    EnterNetworkNamespace();
+    StartController();
+    relay_.emplace(623, kControllersPort, [](auto const&) { return TRelay::AtOnce(); });
+  }
+
+  void StartController() {
+    simulator_.reset();
+    TSimulator::TSettings settings;
+    settings.port = kControllersPort;
+    simulator_.emplace(settings);
+    simulator_->WaitUntilReady();
+  }
+
+  static ipmi::TTarget Target() { return {"127.0.0.1", "623", "zepadmin", "zeppass1"}; }
+
+  // Nothing is sent again however busy this machine is.
+  static ipmi::TTimes Patient() {
+    ipmi::TTimes times;
+    times.contact = times.step = times.close = ipmi::TWaits(3, 20s);
+    return times;
+  }
+
+  static ipmi::TTimes IdleSoon(ipmi::TTimes times) {
+    times.idle = 50ms;
+    return times;
+  }
+
+  static void AddEvent(ipmi::TSession& session) {
+    session.Send(kStorage, kAddEvent, {0, 0, 2, 0, 0, 0, 0, 0x41, 0, 4, 1, 1, 0x6F, 1, 2, 3});
+  }
+  static int Events(ipmi::TSession& session) { return session.Send(kStorage, kEventLogInfo, {}).data.at(1); }
+
+  // What was sent after the first so many requests: "query" for one of version 1.5, else the kind of payload.
+  std::vector<std::string> RequestsAfter(std::size_t first) const {
+    std::map<int, std::string> const kinds = {{0, "message"}, {0x10, "open"}, {0x12, "RAKP 1"}, {0x14, "RAKP 3"}};
+    std::vector<std::string> found, all = relay_->Requests();
+    for (std::size_t n = first; n < all.size(); ++n) found.push_back(all[n][4] == 6 ? kinds.at(all[n][5] & 0x3F) : "query");
+    return found;
+  }
+
+  std::optional<TSimulator> simulator_;
+  std::optional<TRelay> relay_;
+};
+
+TEST_F(SessionTest, ASessionInUseStays) {
+  ipmi::TSession session(Target(), Patient());
+  session.Open();
+  AddEvent(session);
+  std::size_t const before = relay_->Requests().size();
+  AddEvent(session);
+  EXPECT_THAT(RequestsAfter(before), ElementsAre("message"));
+}
+
+TEST_F(SessionTest, AnIdleSessionIsRenewedBeforeTheCommandIsSent) {
+  ipmi::TSession session(Target(), IdleSoon(Patient()));
+  session.Open();
+  std::size_t const before = relay_->Requests().size();
+  std::this_thread::sleep_for(100ms);
+  AddEvent(session);
+  EXPECT_THAT(RequestsAfter(before), ElementsAre("message", "query", "open", "RAKP 1", "RAKP 3", "message", "message"))
+      << "closed, opened, made administrator, and the command";
+  EXPECT_EQ(Events(session), 1);
+}
+
+TEST_F(SessionTest, AnIdleSessionThatTheControllerForgotIsRenewedToo) {
+  ipmi::TSession session(Target(), IdleSoon({}));
+  session.Open();
+  StartController();
+  std::this_thread::sleep_for(100ms);
+  AddEvent(session);
+  EXPECT_EQ(Events(session), 1);
+}
+
+TEST_F(SessionTest, AMessageThatIsTooLongForVersion15IsRefusedAndTheSessionGoesOn) {
+  relay_.reset();
+  relay_.emplace(623, kControllersPort, [](TRelay::TDatagram& datagram) {
+    if (datagram.isAnswer) datagram.bytes = WithoutVersion2(datagram.bytes);
+    return TRelay::AtOnce();
+  });
+  ipmi::TSession session(Target());
+  session.Open();
+  std::size_t const before = relay_->Requests().size();
+  EXPECT_THROW(session.Send(kStorage, kAddEvent, ipmi::TByteVector(255)), ipmi::TFailure);
+  EXPECT_EQ(relay_->Requests().size(), before);
+  AddEvent(session);
+  EXPECT_EQ(relay_->Requests().size(), before + 1) << "in the same session";
+}
+
+}  // namespace
+}  // namespace NQRVZEP20
