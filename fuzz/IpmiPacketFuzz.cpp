@@ -70,7 +70,7 @@ extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size
   TByteVector rest(data + 5 + changes, data + size);
   if (data[0] % 4 == 0) ReadAsItCame(rest);
   rest.resize(std::min<std::size_t>(rest.size(), 200));
-  const TMessage answer = {static_cast<unsigned char>((data[2] & 0x3F) | 1), static_cast<unsigned char>(data[3] & 0x3F), data[4],
+  const TMessage answer = {static_cast<unsigned char>(data[2] % 7 * 2 + 1), static_cast<unsigned char>(data[3] & 0x3F), data[4],
                            rest};
   if (data[0] % 4 == 1) {
     TEnvelope15 controllers(Session15(IPMI_AUTHENTICATION_TYPE_NONE)), clients(Session15(IPMI_AUTHENTICATION_TYPE_NONE));

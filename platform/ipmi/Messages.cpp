@@ -45,6 +45,7 @@ TFields RmcpHeader() {
 }
 
 TFields MessageHeader(TMessage const& message) {
+  if (!IPMI_NET_FN_VALID(message.netFn)) throw TFailure{kIpmiClientBadArgument};
   TFields header(tmpl_lan_msg_hdr_rq);
   Checked(::fill_lan_msg_hdr(IPMI_SLAVE_ADDRESS_BMC, message.netFn, IPMI_BMC_IPMB_LUN_BMC, message.sequence, header.Object()));
   return header;

@@ -35,7 +35,7 @@ public:
   virtual ~IEnvelope() = default;
 
   // A packet with the session's next number, for a message that is sent again too: controllers drop a number that they know.
-  // Throws TFailure{kIpmiClientBadArgument} when the message is too long.
+  // Throws TFailure{kIpmiClientBadArgument} when the message is too long or has a reserved network function.
   virtual TPacket Pack(TMessage const& message) = 0;
 
   // kAnswer when the packet has a reply of this session, to any message, that is newer than those accepted.

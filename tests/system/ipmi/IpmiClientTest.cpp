@@ -230,6 +230,7 @@ TEST_F(IpmiClientTest, ArgumentsThatCannotBeUsedAreRefused) {
   EXPECT_EQ(client_.send(1, bytes, 0, nullptr, &length, &code, 6), kIpmiClientBadArgument);
   EXPECT_EQ(client_.send(1, bytes, 0, bytes, nullptr, &code, 6), kIpmiClientBadArgument);
   EXPECT_EQ(client_.send(1, bytes, 0, bytes, &length, nullptr, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(client_.send(1, bytes, 0, bytes, &length, &code, 0x1E), kIpmiClientBadArgument) << "a reserved network function";
   EXPECT_EQ(client_.send(1, nullptr, 0, bytes, &length, &code, 6), kIpmiClientOk) << "Get Device ID has no data";
   EXPECT_GT(length, 10);
 }
