@@ -7,14 +7,14 @@ namespace NQRVZEP20 {
 void ReadMofFile(std::string const& path, boost::shared_ptr<ICIMNamespace> ns) {
   TMofDocument document;
   TMofSources sources(document);
-  TMofParser(document, sources, sources.OpenFirst(path)).Parse();
+  TMofParser(sources.OpenFirst(path)).ParseFile(document, sources);
   TMofBuilder(document, ns).Build();
 }
 
 void ReadMofText(std::string const& text, std::string const& name, boost::shared_ptr<ICIMNamespace> ns) {
   TMofDocument document;
   TMofSources sources(document);
-  TMofParser(document, sources, sources.OpenText(text, name)).Parse();
+  TMofParser(sources.OpenText(text, name)).ParseFile(document, sources);
   TMofBuilder(document, ns).Build();
 }
 

@@ -3,6 +3,7 @@
 #include "TCIMValue.h"
 #include "TMofError.h"
 
+#include <deque>
 #include <memory>
 #include <optional>
 #include <string>
@@ -11,7 +12,8 @@
 namespace NQRVZEP20 {
 
 // A MOF text as it is written: what the parser makes and the builder declares. Names are parts of the files, which the
-// document owns.
+// document owns. Classes and instances, of which there may be very many, are not kept: the document knows where each stands,
+// and they are read again when they are declared, one after another.
 
 struct TMofLiteral {
   enum EKind { kNull, kBoolean, kNumber, kString, kChar, kAlias };
@@ -81,11 +83,25 @@ struct TMofInstance {
   std::vector<TMofAssignment> fValues;
 };
 
+// Where a class stands.
+struct TMofClassText {
+  TMofFile const* fFile;
+  char const* fStart;    // of its qualifiers
+  char const* fKeyword;  // "class"
+};
+
+// Where an instance stands.
+struct TMofInstanceText {
+  TMofFile const* fFile;
+  char const* fKeyword;  // "instance"
+};
+
+// The form of everything in it is right.
 struct TMofDocument {
   std::vector<std::unique_ptr<TMofFile>> fFiles;
   std::vector<TMofQualifierDecl> fQualifierDecls;
-  std::vector<TMofClass> fClasses;
-  std::vector<TMofInstance> fInstances;
+  std::deque<TMofClassText> fClasses;
+  std::deque<TMofInstanceText> fInstances;
 };
 
 }  // namespace NQRVZEP20

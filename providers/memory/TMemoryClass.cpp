@@ -5,22 +5,22 @@
 #include "KeyText.h"
 #include "TMemoryNamespace.h"
 
+#include <algorithm>
+
 namespace NQRVZEP20 {
 
 TMemoryClass::TMemoryClass(boost::weak_ptr<TMemoryNamespace> ns, boost::shared_ptr<TMemoryClass> superClass,
                            std::string const& name)
-    : TMemoryNamedElement(name, ns), fIsRoot(!superClass), fSuperClass(superClass) {}
+    : TMemoryNamedElement(name, ns),
+      fIsRoot(!superClass),
+      fIsAssociation(superClass && superClass->fIsAssociation),
+      fSuperClass(superClass) {}
 
 boost::shared_ptr<ICIMNamespace> TMemoryClass::GetNamespace(TCIMContext const&) const {
   return boost::shared_ptr<ICIMNamespace>(Namespace());
 }
 
-bool TMemoryClass::GetClassFlag(TCIMContext const&) const {
-  if (IsMarked("Association")) return true;
-  for (boost::shared_ptr<TMemoryClass> cls = SuperClass(); cls; cls = cls->SuperClass())
-    if (cls->IsMarked("Association")) return true;
-  return false;
-}
+bool TMemoryClass::GetClassFlag(TCIMContext const&) const { return fIsAssociation; }
 
 bool TMemoryClass::IsAbstract(TCIMContext const&) const { return IsMarked("Abstract"); }
 
@@ -30,6 +30,14 @@ boost::shared_ptr<ICIMClass> TMemoryClass::GetSuperClass(TCIMContext const&) con
 
 void TMemoryClass::EnumerateSubClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)> callback, TCIMContext const&) const {
   VisitEach(AllSubClasses(), callback);
+}
+
+boost::shared_ptr<ICIMQualifier> TMemoryClass::AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration,
+                                                            TCIMValue const& value, unsigned int flavor,
+                                                            TCIMContext const& context) {
+  const auto qualifier = TMemoryNamedElement::AddQualifier(declaration, value, flavor, context);
+  if (!fIsAssociation && IsMarked("Association")) MarkAsAssociation();
+  return qualifier;
 }
 
 void TMemoryClass::BeginDeclarations(TCIMContext const&) { fIsDeclaring = true; }
@@ -44,7 +52,7 @@ boost::shared_ptr<ICIMPropertyDecl> TMemoryClass::AddPropertyDecl(std::string co
   if (HasMadeInstances()) throw TZEPException(kZEPStatusInvalidOpSequence);
 
   const auto decl = boost::make_shared<TMemoryPropertyDecl>(name, defaultValue, Self(), Namespace());
-  fPropertyDecls.Add(name, decl);
+  fPropertyDecls.Add(decl);
   return decl;
 }
 
@@ -65,7 +73,7 @@ void TMemoryClass::SetStaticProperty(std::string const& name, TCIMValue const& v
 
   const auto property = boost::make_shared<TMemoryProperty>(decl);
   property->SetValue(value, context);
-  fStaticProperties.Put(name, property);
+  fStaticProperties.Put(property);
 }
 
 void TMemoryClass::EnumerateStaticProperties(boost::function<bool(boost::shared_ptr<ICIMProperty>)> callback,
@@ -91,7 +99,7 @@ boost::shared_ptr<ICIMMethodDecl> TMemoryClass::AddMethodDecl(std::string const&
   if (fMethodDecls.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
 
   const auto decl = boost::make_shared<TMemoryMethodDecl>(name, returnType, Self(), Namespace());
-  fMethodDecls.Add(name, decl);
+  fMethodDecls.Add(decl);
   return decl;
 }
 
@@ -125,6 +133,7 @@ boost::shared_ptr<TMemoryClass> TMemoryClass::SuperClass() const {
 }
 
 boost::shared_ptr<TMemoryPropertyDecl> TMemoryClass::FindPropertyDecl(std::string const& name) const {
+  if (fLayout) return boost::const_pointer_cast<TMemoryPropertyDecl>(fLayout->fDecls.Find(name));
   boost::shared_ptr<TMemoryPropertyDecl> found = fPropertyDecls.Find(name);
   for (boost::shared_ptr<TMemoryClass> cls = SuperClass(); cls && !found; cls = cls->SuperClass())
     found = cls->fPropertyDecls.Find(name);
@@ -141,6 +150,7 @@ void TMemoryClass::Empty() {
   fInstancesByKeys.clear();
   fInstances.clear();
   fLayout.reset();
+  fHasMadeInstances = false;
   fStaticProperties.Clear();
   fMethodDecls.Clear();
   fPropertyDecls.Clear();
@@ -160,24 +170,50 @@ std::vector<boost::shared_ptr<TMemoryClass>> TMemoryClass::AllSubClasses() const
   return all;
 }
 
-// Made from the top class down, because each builds on that of its superclass.
+// The class and all below it. Where one is marked already, those below it are, too.
+void TMemoryClass::MarkAsAssociation() {
+  std::vector<TMemoryClass*> pending{this};
+  while (!pending.empty()) {
+    TMemoryClass* const next = pending.back();
+    pending.pop_back();
+    if (next->fIsAssociation) continue;
+    next->fIsAssociation = true;
+    for (auto const& subClass : next->fSubClasses) pending.push_back(subClass.get());
+  }
+}
+
+// Made from the nearest superclass that has one, downwards. So that the way to it stays short beside the layout itself,
+// however deep the class lies, some of the classes on the way get theirs, too; one that declares nothing shares its
+// superclass's.
 boost::shared_ptr<TMemoryLayout const> TMemoryClass::Layout() {
   std::vector<boost::shared_ptr<TMemoryClass>> without;
-  for (boost::shared_ptr<TMemoryClass> cls = Self(); cls && !cls->fLayout; cls = cls->SuperClass()) without.push_back(cls);
-  for (auto cls = without.rbegin(); cls != without.rend(); ++cls) (*cls)->MakeLayout();
+  boost::shared_ptr<TMemoryClass> cls = Self();
+  for (; cls && !cls->fLayout; cls = cls->SuperClass()) without.push_back(cls);
+
+  boost::shared_ptr<TMemoryLayout const> last = cls ? cls->fLayout : boost::make_shared<TMemoryLayout>();
+  TMemoryLayout layout = *last;
+  std::size_t steps = 0;  // since `last`
+  for (auto next = without.rbegin(); next != without.rend(); ++next) {
+    (*next)->fHasMadeInstances = true;
+    (*next)->DeclareIn(layout);
+    const bool isSame = steps == 0 && (*next)->fPropertyDecls.Elements().empty();
+    if (!isSame && ++steps < layout.fDecls.Elements().size() && next->get() != this) continue;
+    if (!isSame) last = boost::make_shared<TMemoryLayout>(layout);
+    (*next)->fLayout = last;
+    steps = 0;
+  }
   return fLayout;
 }
 
-// What the superclass has, with this class's own declarations put in or added.
-void TMemoryClass::MakeLayout() {
-  const auto layout = boost::make_shared<TMemoryLayout>();
-  if (const boost::shared_ptr<TMemoryClass> superClass = SuperClass()) layout->fDecls = superClass->fLayout->fDecls;
-  for (auto const& decl : fPropertyDecls.Elements()) layout->fDecls.Put(decl->GetName(TCIMContext()), decl);
-
-  auto const& decls = layout->fDecls.Elements();
-  for (std::size_t i = 0; i < decls.size(); ++i)
-    if (decls[i]->IsKey(TCIMContext())) layout->fKeys.push_back(i);
-  fLayout = layout;
+// Puts its declarations in the place of those that they override, or adds them.
+void TMemoryClass::DeclareIn(TMemoryLayout& layout) const {
+  for (auto const& decl : fPropertyDecls.Elements()) {
+    layout.fDecls.Put(decl);
+    if (!decl->IsMarked("Key")) continue;
+    const std::size_t position = layout.fDecls.PositionOf(decl->Name());
+    const auto place = std::lower_bound(layout.fKeys.begin(), layout.fKeys.end(), position);
+    if (place == layout.fKeys.end() || *place != position) layout.fKeys.insert(place, position);
+  }
 }
 
 }  // namespace NQRVZEP20

@@ -27,6 +27,9 @@ public:
   void EnumerateSubClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)> callback,
                            TCIMContext const& context) const override;
 
+  boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
+                                                unsigned int flavor, TCIMContext const& context) override;
+
   void BeginDeclarations(TCIMContext const& context) override;
   void EndDeclarations(TCIMContext const& context) override;
   boost::shared_ptr<ICIMPropertyDecl> AddPropertyDecl(std::string const& name, TCIMValue const& defaultValue,
@@ -63,7 +66,7 @@ public:
   // The declaration in this class or the nearest in its superclasses; empty when there is none.
   boost::shared_ptr<TMemoryPropertyDecl> FindPropertyDecl(std::string const& name) const;
 
-  bool HasMadeInstances() const { return fLayout != nullptr; }
+  bool HasMadeInstances() const { return fHasMadeInstances; }  // or a subclass has
 
   // The instance of this class itself that was committed with the keys of the path; empty when there is none.
   boost::shared_ptr<TMemoryInstance> FindInstance(TCIMReference const& path) const;
@@ -76,12 +79,15 @@ public:
 
 private:
   boost::shared_ptr<TMemoryClass> Self() { return boost::static_pointer_cast<TMemoryClass>(shared_from_this()); }
-  boost::shared_ptr<TMemoryLayout const> Layout();  // made at the first call, for the superclasses too
-  void MakeLayout();
+  boost::shared_ptr<TMemoryLayout const> Layout();  // made at the first call
+  void DeclareIn(TMemoryLayout& layout) const;
+  void MarkAsAssociation();
   std::vector<boost::shared_ptr<TMemoryClass>> AllSubClasses() const;  // in the order of EnumerateSubClasses
 
   bool const fIsRoot;
   bool fIsDeclaring = false;
+  bool fIsAssociation;             // it or a superclass carries the qualifier
+  bool fHasMadeInstances = false;  // or a subclass has
   boost::weak_ptr<TMemoryClass> fSuperClass;
   std::vector<boost::shared_ptr<TMemoryClass>> fSubClasses;  // the direct ones
 
@@ -89,7 +95,7 @@ private:
   TNamedList<TMemoryMethodDecl> fMethodDecls;
   TNamedList<TMemoryProperty> fStaticProperties;
 
-  boost::shared_ptr<TMemoryLayout const> fLayout;  // empty until the class or a subclass makes its first instance
+  boost::shared_ptr<TMemoryLayout const> fLayout;  // made for the first instance; some superclasses have one, too
   std::vector<boost::shared_ptr<TMemoryInstance>> fInstances;
   std::unordered_map<std::string, boost::shared_ptr<TMemoryInstance>> fInstancesByKeys;  // those that have a key value
 };

@@ -32,7 +32,7 @@ boost::shared_ptr<ICIMParameterDecl> TMemoryMethodDecl::AddParameterDecl(std::st
 
   const auto self = boost::static_pointer_cast<TMemoryMethodDecl>(shared_from_this());
   const auto decl = boost::make_shared<TMemoryParameterDecl>(name, type, maxArraySize, referencedClassName, self, Namespace());
-  fParameterDecls.Add(name, decl);
+  fParameterDecls.Add(decl);
   return decl;
 }
 

@@ -36,10 +36,13 @@ public:
     if (value.GetType() != declaration->GetType(context)) throw TZEPException(kZEPStatusTypeMismatch);
     if (fQualifiers.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
 
-    const auto qualifier = boost::make_shared<TMemoryQualifier>(declaration, this->weak_from_this(), value, flavor);
-    fQualifiers.Add(name, qualifier);
+    const auto own = boost::static_pointer_cast<TMemoryQualifierDecl>(declaration);  // the namespace made it
+    const auto qualifier = boost::make_shared<TMemoryQualifier>(own, this->weak_from_this(), value, flavor);
+    fQualifiers.Add(qualifier);
     return qualifier;
   }
+
+  std::string const& Name() const { return fName; }
 
   // Whether the element itself carries the qualifier, with any value but false.
   bool IsMarked(std::string const& qualifierName) const {
@@ -50,7 +53,6 @@ public:
 protected:
   TMemoryNamedElement(std::string const& name, boost::weak_ptr<ICIMNamespace> ns) : fName(name), fNamespace(ns) {}
 
-  std::string const& Name() const { return fName; }
   boost::weak_ptr<ICIMNamespace> Namespace() const { return fNamespace; }
 
 private:

@@ -30,7 +30,7 @@ boost::shared_ptr<ICIMClass> TMemoryNamespace::CreateClass(boost::shared_ptr<ICI
   if (fClasses.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
 
   const auto cls = boost::make_shared<TMemoryClass>(shared_from_this(), ownSuperClass, name);
-  fClasses.Add(name, cls);
+  fClasses.Add(cls);
   if (ownSuperClass)
     ownSuperClass->AddSubClass(cls);
   else
@@ -56,7 +56,7 @@ boost::shared_ptr<ICIMQualifierDecl> TMemoryNamespace::CreateQualifierDecl(std::
   if (fQualifierDecls.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
 
   const auto decl = boost::make_shared<TMemoryQualifierDecl>(name, defaultValue, scope, flavor);
-  fQualifierDecls.Add(name, decl);
+  fQualifierDecls.Add(decl);
   return decl;
 }
 

@@ -1,14 +1,14 @@
 #include "TMemoryProperty.h"
 
 #include "CIMTypes.h"
-#include "ICIMPropertyDecl.h"
+#include "TMemoryPropertyDecl.h"
 #include "TZEPException.h"
 
 #include <utility>
 
 namespace NQRVZEP20 {
 
-TMemoryProperty::TMemoryProperty(boost::shared_ptr<ICIMPropertyDecl const> declaration)
+TMemoryProperty::TMemoryProperty(boost::shared_ptr<TMemoryPropertyDecl const> declaration)
     : fDeclaration(declaration), fValue(declaration->GetDefaultValue(TCIMContext())) {}
 
 TCIMValue TMemoryProperty::GetValue(TCIMContext const&) const { return fValue; }
@@ -29,6 +29,8 @@ void TMemoryProperty::DropReference() {
 }
 
 std::string TMemoryProperty::GetName(TCIMContext const& context) const { return fDeclaration->GetName(context); }
+
+std::string const& TMemoryProperty::Name() const { return fDeclaration->Name(); }
 
 boost::shared_ptr<ICIMPropertyDecl const> TMemoryProperty::GetDeclaration(TCIMContext const&) const { return fDeclaration; }
 

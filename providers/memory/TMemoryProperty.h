@@ -5,16 +5,20 @@
 
 namespace NQRVZEP20 {
 
+class TMemoryPropertyDecl;
+
 // One property value. Made by TMemoryClass, for an instance or for the class itself.
 class TMemoryProperty : public ICIMProperty {
 public:
   // Starts with the declared default.
-  explicit TMemoryProperty(boost::shared_ptr<ICIMPropertyDecl const> declaration);
+  explicit TMemoryProperty(boost::shared_ptr<TMemoryPropertyDecl const> declaration);
 
   TCIMValue GetValue(TCIMContext const& context) const override;
   void SetValue(TCIMValue const& value, TCIMContext const& context) override;
   std::string GetName(TCIMContext const& context) const override;
   boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(TCIMContext const& context) const override;
+
+  std::string const& Name() const;
 
   // From now on SetValue throws kZEPStatusInvalidOpSequence: the value is a key by which the instance is filed.
   void Fix() { fIsFixed = true; }
@@ -23,7 +27,7 @@ public:
   void DropReference();
 
 private:
-  boost::shared_ptr<ICIMPropertyDecl const> fDeclaration;
+  boost::shared_ptr<TMemoryPropertyDecl const> fDeclaration;
   TCIMValue fValue;  // always of the declared type
   bool fIsFixed = false;
 };

@@ -16,7 +16,7 @@ TMemoryPropertyDecl::TMemoryPropertyDecl(std::string const& name, TCIMValue cons
 
 TCIMValue::TCIMType TMemoryPropertyDecl::GetType(TCIMContext const&) const { return fDefaultValue.GetType(); }
 
-TCIMValue TMemoryPropertyDecl::GetDefaultValue(TCIMContext const&) const { return fDefaultValue; }
+TCIMValue TMemoryPropertyDecl::GetDefaultValue(TCIMContext const&) const { return fDefaultValue.Get(); }
 
 bool TMemoryPropertyDecl::IsKey(TCIMContext const&) const {
   if (IsMarked(kKey)) return true;

@@ -2,6 +2,7 @@
 
 #include "ICIMPropertyDecl.h"
 #include "TMemoryNamedElement.h"
+#include "TStoredValue.h"
 
 namespace NQRVZEP20 {
 
@@ -24,7 +25,7 @@ public:
 private:
   boost::shared_ptr<TMemoryPropertyDecl const> OverriddenDecl() const;  // empty when there is none
 
-  TCIMValue fDefaultValue;
+  TStoredValue fDefaultValue;
   boost::weak_ptr<TMemoryClass> fOwner;
 };
 

@@ -4,13 +4,13 @@
 
 namespace NQRVZEP20 {
 
-TMemoryQualifier::TMemoryQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, boost::weak_ptr<ICIMNamedElement> owner,
+TMemoryQualifier::TMemoryQualifier(boost::shared_ptr<TMemoryQualifierDecl> declaration, boost::weak_ptr<ICIMNamedElement> owner,
                                    TCIMValue const& value, unsigned int flavor)
     : fDeclaration(declaration), fOwner(owner), fValue(value), fFlavor(flavor) {}
 
 std::string TMemoryQualifier::GetName(TCIMContext const& context) const { return fDeclaration->GetName(context); }
 
-TCIMValue TMemoryQualifier::GetValue(TCIMContext const&) const { return fValue; }
+TCIMValue TMemoryQualifier::GetValue(TCIMContext const&) const { return fValue.Get(); }
 
 unsigned int TMemoryQualifier::GetFlavor(TCIMContext const&) const { return fFlavor; }
 
@@ -18,9 +18,6 @@ boost::shared_ptr<ICIMQualifierDecl> TMemoryQualifier::GetDeclaration(TCIMContex
 
 boost::weak_ptr<ICIMNamedElement> TMemoryQualifier::GetOwner(TCIMContext const&) const { return fOwner; }
 
-bool TMemoryQualifier::IsSet() const {
-  const bool isFalse = !fValue.IsNull() && fValue.GetType() == TCIMValue::TCIMType::kCIMTypeBoolean && !static_cast<bool>(fValue);
-  return !isFalse;
-}
+bool TMemoryQualifier::IsSet() const { return !fValue.IsFalse(); }
 
 }  // namespace NQRVZEP20

@@ -17,6 +17,8 @@ public:
   unsigned int GetFlavor(TCIMContext const& context) const override;
   TCIMValue GetDefaultValue(TCIMContext const& context) const override;
 
+  std::string const& Name() const { return fName; }
+
 private:
   std::string fName;
   TCIMValue fDefaultValue;

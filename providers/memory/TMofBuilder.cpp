@@ -9,6 +9,7 @@
 #include "MofRefusal.h"
 #include "MofValues.h"
 #include "TMofInstances.h"
+#include "TMofParser.h"
 #include "TZEPException.h"
 
 namespace NQRVZEP20 {
@@ -25,8 +26,12 @@ void TMofBuilder::Build() {
   for (TMofQualifierDecl const& decl : fDocument.fQualifierDecls) DeclareQualifier(decl);
   std::vector<boost::shared_ptr<ICIMClass>> made;
   made.reserve(fDocument.fClasses.size());
-  for (TMofClass const& cls : fDocument.fClasses) made.push_back(CreateClass(cls));
-  for (std::size_t at = 0; at < made.size(); ++at) DescribeClass(fDocument.fClasses[at], *made[at]);
+  for (TMofClassText const& cls : fDocument.fClasses)
+    made.push_back(CreateClass(TMofParser(*cls.fFile, cls.fKeyword).ParseClassHead()));
+  for (std::size_t at = 0; at < made.size(); ++at) {
+    TMofClassText const& cls = fDocument.fClasses[at];
+    DescribeClass(TMofParser(*cls.fFile, cls.fStart).ParseClass(), *made[at]);
+  }
   TMofInstances(fDocument, fNamespace).Build();
 }
 

@@ -7,7 +7,9 @@
 #include "ICIMPropertyDecl.h"
 #include "MofRefusal.h"
 #include "MofValues.h"
+#include "TMofParser.h"
 
+#include <algorithm>
 #include <set>
 
 namespace NQRVZEP20 {
@@ -24,7 +26,8 @@ bool IsAlias(TMofValue const& value) { return !value.fIsArray && value.fLiterals
 
 void TMofInstances::Build() {
   const std::size_t count = fDocument.fInstances.size();
-  for (TMofInstance const& instance : fDocument.fInstances) Create(instance);
+  for (TMofInstanceText const& instance : fDocument.fInstances)
+    Create(TMofParser(*instance.fFile, instance.fKeyword).ParseInstanceHead());
   for (std::size_t number = 0; number < count; ++number) SetPlainValues(number);
   for (std::size_t number = 0; number < count; ++number) SetKeys(number);
   for (std::size_t number = 0; number < count; ++number) Commit(number);
@@ -38,16 +41,21 @@ void TMofInstances::Create(TMofInstance const& instance) {
                             [&] { return cls->CreateInstance(kNone); });
   if (!instance.fAlias.fText.empty() && !fAliases.emplace(FoldName(NameAt(instance.fAlias)), fMade.size()).second)
     throw TMofError(instance.fAlias, NameAt(instance.fAlias) + " is the alias of another instance");
-  fMade.push_back({cls, made, kNotSet});
+  fMade.push_back({instance.fClassName, cls, made, kNotSet});
 }
 
 void TMofInstances::SetPlainValues(std::size_t number) {
+  TMofInstanceText const& text = fDocument.fInstances[number];
+  const TMofInstance instance = TMofParser(*text.fFile, text.fKeyword).ParseInstance();
   std::set<std::string> seen;
-  for (TMofAssignment const& assignment : fDocument.fInstances[number].fValues) {
+  for (TMofAssignment const& assignment : instance.fValues) {
     if (!seen.insert(FoldName(NameAt(assignment.fName))).second)
       throw TMofError(assignment.fName, NameAt(assignment.fName) + " has a value already");
     const auto property = PropertyOf(number, assignment.fName);
-    if (IsAlias(assignment.fValue)) continue;
+    if (IsAlias(assignment.fValue)) {
+      fAliasValues.push_back({number, assignment.fName, assignment.fValue.fPlace});
+      continue;
+    }
     const TCIMValue pattern = property->GetDeclaration(kNone)->GetDefaultValue(kNone);
     const TCIMValue value = ReadMofValue(assignment.fValue, pattern.GetType(), pattern.GetMaxArraySize(), fNamespace);
     AtPlace(assignment.fName, kZEPStatusOK, "", [&] { property->SetValue(value, kNone); });
@@ -65,18 +73,18 @@ void TMofInstances::SetKeys(std::size_t number) {
 
 // Those among the keys, or all others.
 void TMofInstances::SetAliases(std::size_t number, bool keys) {
-  for (TMofAssignment const& assignment : fDocument.fInstances[number].fValues) {
-    if (!IsAlias(assignment.fValue)) continue;
-    const auto property = PropertyOf(number, assignment.fName);
-    const auto declaration = property->GetDeclaration(kNone);
-    if (declaration->IsKey(kNone) != keys) continue;
-    const TCIMValue path = PathOf(assignment.fValue.fPlace);
-    AtPlace(assignment.fName, kZEPStatusTypeMismatch, "is no reference", [&] { property->SetValue(path, kNone); });
+  const auto isBefore = [](TAliasValue const& value, std::size_t wanted) { return value.fNumber < wanted; };
+  auto value = std::lower_bound(fAliasValues.begin(), fAliasValues.end(), number, isBefore);
+  for (; value != fAliasValues.end() && value->fNumber == number; ++value) {
+    const auto property = PropertyOf(number, value->fName);
+    if (property->GetDeclaration(kNone)->IsKey(kNone) != keys) continue;
+    const TCIMValue path = PathOf(value->fAlias);
+    AtPlace(value->fName, kZEPStatusTypeMismatch, "is no reference", [&] { property->SetValue(path, kNone); });
   }
 }
 
 void TMofInstances::Commit(std::size_t number) {
-  AtPlace(fDocument.fInstances[number].fClassName, kZEPStatusAlreadyExists, "has another instance with the same keys",
+  AtPlace(fMade[number].fClassName, kZEPStatusAlreadyExists, "has another instance with the same keys",
           [&] { fMade[number].fClass->CommitInstance(fMade[number].fInstance, kNone); });
 }
 

@@ -23,7 +23,14 @@ public:
 private:
   enum EKeys { kNotSet, kBeingSet, kSet };
 
+  // An alias as the value of a property.
+  struct TAliasValue {
+    std::size_t fNumber;  // of the instance, in fMade
+    TMofPlace fName, fAlias;
+  };
+
   struct TMade {
+    TMofPlace fClassName;
     boost::shared_ptr<ICIMClass> fClass;
     boost::shared_ptr<ICIMInstance> fInstance;
     EKeys fKeys;
@@ -42,6 +49,7 @@ private:
   std::size_t fDepth = 0;                                 // of the keys that are being set
   std::vector<TMade> fMade;                               // one for each instance of the document
   std::unordered_map<std::string, std::size_t> fAliases;  // into fMade, by name in small letters
+  std::vector<TAliasValue> fAliasValues;                  // in the order of the instances
 };
 
 }  // namespace NQRVZEP20

@@ -25,7 +25,10 @@ struct TMofToken {
 // Cuts a text into tokens; blanks and comments fall away. Throws TMofError for what is no token.
 class TMofLexer {
 public:
-  explicit TMofLexer(TMofFile const& file) : fFile(file), fNext(file.fText.data()), fEnd(fNext + file.fText.size()) {}
+  explicit TMofLexer(TMofFile const& file) : TMofLexer(file, file.fText.data()) {}
+
+  // From `start` on, which lies in the text.
+  TMofLexer(TMofFile const& file, char const* start) : fFile(file), fNext(start), fEnd(file.fText.data() + file.fText.size()) {}
 
   TMofToken Next();  // at the end of the text kEnd, as often as it is called
 

@@ -48,47 +48,52 @@ TType IntrinsicType(std::string_view word) {
 
 }  // namespace
 
-TMofParser::TMofParser(TMofDocument& document, TMofSources& sources, TMofFile const& file)
-    : fDocument(document), fSources(sources), fFile(file), fLexer(file), fToken(fLexer.Next()) {}
+TMofParser::TMofParser(TMofFile const& file, char const* start) : fFile(file), fLexer(file, start), fToken(fLexer.Next()) {}
 
-void TMofParser::Parse() {
+void TMofParser::ParseFile(TMofDocument& document, TMofSources& sources) {
   while (fToken.fKind != TMofToken::kEnd) {
     if (fToken.fKind == TMofToken::kPragma)
-      ParsePragma();
+      ParsePragma(document, sources);
     else if (IsWord("qualifier"))
-      ParseQualifierDecl();
+      document.fQualifierDecls.push_back(ParseQualifierDecl());
     else if (IsMark('[') || IsWord("class") || IsWord("instance"))
-      ParseClassOrInstance();
+      ParseClassOrInstance(document);
     else
       Refuse("\"qualifier\", \"class\", \"instance\" or a pragma");
   }
 }
 
-void TMofParser::ParseClassOrInstance() {
-  TMofQualifiers qualifiers = ParseQualifiers();
-  if (IsWord("class"))
-    ParseClass(std::move(qualifiers));
-  else if (IsWord("instance"))
+// Reads it to see whether its form is right, and notes where it stands. An instance has no qualifiers: those before it are
+// dropped.
+void TMofParser::ParseClassOrInstance(TMofDocument& document) {
+  char const* const start = fToken.fText.data();
+  ParseQualifiers();
+  char const* const keyword = fToken.fText.data();
+  if (IsWord("class")) {
+    ParseClass();
+    document.fClasses.push_back({&fFile, start, keyword});
+  } else if (IsWord("instance")) {
     ParseInstance();
-  else
+    document.fInstances.push_back({&fFile, keyword});
+  } else
     Refuse("\"class\" or \"instance\"");
 }
 
 // An include is read where it stands; every other pragma is passed over.
-void TMofParser::ParsePragma() {
+void TMofParser::ParsePragma(TMofDocument& document, TMofSources& sources) {
   Advance();
   const TMofPlace name = ExpectName("the name of a pragma");
   Expect('(');
   const TMofPlace argument = Here();
   const std::string text = ParseString();
   if (IsSameName(name.fText, "include")) {
-    TMofParser(fDocument, fSources, fSources.OpenIncluded(text, argument)).Parse();
-    fSources.CloseIncluded();
+    TMofParser(sources.OpenIncluded(text, argument)).ParseFile(document, sources);
+    sources.CloseIncluded();
   }
   Expect(')');
 }
 
-void TMofParser::ParseQualifierDecl() {
+TMofQualifierDecl TMofParser::ParseQualifierDecl() {
   Advance();
   TMofQualifierDecl decl;
   decl.fName = ExpectName("the name of a qualifier");
@@ -106,7 +111,7 @@ void TMofParser::ParseQualifierDecl() {
     Expect(')');
   }
   Expect(';');
-  fDocument.fQualifierDecls.push_back(std::move(decl));
+  return decl;
 }
 
 unsigned int TMofParser::ParseScope() {
@@ -141,27 +146,29 @@ unsigned int TMofParser::ParseFlavor(bool inDeclaration) {
   }
 }
 
-void TMofParser::ParseClass(TMofQualifiers qualifiers) {
-  Advance();
-  TMofClass cls;
+TMofClass TMofParser::ParseClass() {
+  TMofQualifiers qualifiers = ParseQualifiers();
+  TMofClass cls = ParseClassHead();
   cls.fQualifiers = std::move(qualifiers);
-  cls.fName = ExpectName("the name of a class");
-  ParseAlias();
-  if (Skip(':')) cls.fSuperClass = ExpectName("the name of the superclass");
   Expect('{');
   while (!IsMark('}')) cls.fFeatures.push_back(ParseFeature());
   Advance();
   Expect(';');
-  fDocument.fClasses.push_back(std::move(cls));
+  return cls;
 }
 
-// Qualifiers of instances, and of their values, are read and dropped: an instance has none.
-void TMofParser::ParseInstance() {
+TMofClass TMofParser::ParseClassHead() {
   Advance();
-  if (!SkipWord("of")) Refuse("\"of\"");
-  TMofInstance instance;
-  instance.fClassName = ExpectName("the name of a class");
-  instance.fAlias = ParseAlias();
+  TMofClass cls;
+  cls.fName = ExpectName("the name of a class");
+  ParseAlias();
+  if (Skip(':')) cls.fSuperClass = ExpectName("the name of the superclass");
+  return cls;
+}
+
+// Qualifiers of values are read and dropped, as those of the instance are.
+TMofInstance TMofParser::ParseInstance() {
+  TMofInstance instance = ParseInstanceHead();
   Expect('{');
   while (!IsMark('}')) {
     ParseQualifiers();
@@ -174,7 +181,16 @@ void TMofParser::ParseInstance() {
   }
   Advance();
   Expect(';');
-  fDocument.fInstances.push_back(std::move(instance));
+  return instance;
+}
+
+TMofInstance TMofParser::ParseInstanceHead() {
+  Advance();
+  if (!SkipWord("of")) Refuse("\"of\"");
+  TMofInstance instance;
+  instance.fClassName = ExpectName("the name of a class");
+  instance.fAlias = ParseAlias();
+  return instance;
 }
 
 TMofQualifiers TMofParser::ParseQualifiers() {

@@ -9,21 +9,26 @@
 
 namespace NQRVZEP20 {
 
-// Reads one file, and those that it includes, into a document: its form only, not whether it makes sense. Throws TMofError,
-// which tells what was expected.
+// Reads MOF: its form only, not whether it makes sense. Throws TMofError, which tells what was expected.
 class TMofParser {
 public:
-  TMofParser(TMofDocument& document, TMofSources& sources, TMofFile const& file);
+  explicit TMofParser(TMofFile const& file) : TMofParser(file, file.fText.data()) {}
+  TMofParser(TMofFile const& file, char const* start);  // begins there in the text
 
-  void Parse();
+  // The whole file, and those that it includes, into the document.
+  void ParseFile(TMofDocument& document, TMofSources& sources);
+
+  // What stands where the parser begins. Without features, or values, these read no further than they have to.
+  TMofClass ParseClass();            // from its qualifiers or from "class"
+  TMofClass ParseClassHead();        // from "class"; without features
+  TMofInstance ParseInstance();      // from "instance"
+  TMofInstance ParseInstanceHead();  // from "instance"; without values
 
 private:
   // ---- Productions ----
-  void ParsePragma();
-  void ParseQualifierDecl();
-  void ParseClassOrInstance();
-  void ParseClass(TMofQualifiers qualifiers);
-  void ParseInstance();
+  void ParsePragma(TMofDocument& document, TMofSources& sources);
+  TMofQualifierDecl ParseQualifierDecl();
+  void ParseClassOrInstance(TMofDocument& document);
   TMofQualifiers ParseQualifiers();
   TMofQualifier ParseQualifier();
   unsigned int ParseScope();
@@ -52,8 +57,6 @@ private:
   TMofPlace ExpectName(char const* what);
   [[noreturn]] void Refuse(std::string const& expected) const;
 
-  TMofDocument& fDocument;
-  TMofSources& fSources;
   TMofFile const& fFile;
   TMofLexer fLexer;
   TMofToken fToken;  // the next one

@@ -5,8 +5,8 @@
 #include <boost/shared_ptr.hpp>
 
 #include <cstddef>
+#include <cstdint>
 #include <string>
-#include <unordered_map>
 #include <vector>
 
 namespace NQRVZEP20 {
@@ -22,30 +22,40 @@ bool VisitEach(std::vector<boost::shared_ptr<TElement>> const& elements, TCallba
   return true;
 }
 
-// Elements in the order in which they were added, which are found by name in constant time.
+// Elements in the order in which they were added, which are found by name in constant time. An element tells its name by
+// Name(). Most lists are short, and there are very many: one of few elements has no index, and no list has names of its own.
 template <class TElement>
 class TNamedList {
 public:
   static constexpr std::size_t kNone = static_cast<std::size_t>(-1);
 
   // The list has no element of that name yet.
-  void Add(std::string const& name, boost::shared_ptr<TElement> element) {
-    fPositions.emplace(name, fElements.size());
+  void Add(boost::shared_ptr<TElement> element) {
     fElements.push_back(std::move(element));
+    if (fElements.size() <= kMostWithoutIndex) return;
+    if (2 * fElements.size() > fIndex.size())
+      MakeIndex();
+    else
+      Enter(fElements.size() - 1);
   }
 
   // Takes the place of the element of that name, which is there, or else goes to the end.
-  void Put(std::string const& name, boost::shared_ptr<TElement> element) {
-    const std::size_t position = PositionOf(name);
-    if (position == kNone) return Add(name, std::move(element));
+  void Put(boost::shared_ptr<TElement> element) {
+    const std::size_t position = PositionOf(element->Name());
+    if (position == kNone) return Add(std::move(element));
     fElements[position] = std::move(element);
   }
 
   bool Has(std::string const& name) const { return PositionOf(name) != kNone; }
 
   std::size_t PositionOf(std::string const& name) const {
-    const auto found = fPositions.find(name);
-    return found == fPositions.end() ? kNone : found->second;
+    if (!fIndex.empty()) {
+      const std::uint32_t entry = fIndex[SlotOf(name)];
+      return entry == 0 ? kNone : entry - 1;
+    }
+    for (std::size_t i = 0; i < fElements.size(); ++i)
+      if (IsSameName(fElements[i]->Name(), name)) return i;
+    return kNone;
   }
 
   // Empty when there is none of that name.
@@ -57,13 +67,33 @@ public:
   std::vector<boost::shared_ptr<TElement>> const& Elements() const { return fElements; }
 
   void Clear() {
-    fPositions.clear();
+    fIndex.clear();
     fElements.clear();
   }
 
 private:
+  static constexpr std::size_t kMostWithoutIndex = 8;
+
+  // The slot of the element of that name, or the free one where it belongs.
+  std::size_t SlotOf(std::string const& name) const {
+    const std::size_t mask = fIndex.size() - 1;
+    std::size_t slot = TNameHash()(name) & mask;
+    while (fIndex[slot] != 0 && !IsSameName(fElements[fIndex[slot] - 1]->Name(), name)) slot = (slot + 1) & mask;
+    return slot;
+  }
+
+  void Enter(std::size_t position) { fIndex[SlotOf(fElements[position]->Name())] = static_cast<std::uint32_t>(position + 1); }
+
+  // Anew, with room for as many again.
+  void MakeIndex() {
+    std::size_t size = 4 * kMostWithoutIndex;
+    while (size < 3 * fElements.size()) size *= 2;
+    fIndex.assign(size, 0);
+    for (std::size_t i = 0; i < fElements.size(); ++i) Enter(i);
+  }
+
   std::vector<boost::shared_ptr<TElement>> fElements;
-  std::unordered_map<std::string, std::size_t, TNameHash, TNameEqual> fPositions;  // into fElements
+  std::vector<std::uint32_t> fIndex;  // empty, or a hash table: positions plus 1, and 0 for a free slot; a power of 2
 };
 
 }  // namespace NQRVZEP20

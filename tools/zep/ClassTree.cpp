@@ -7,12 +7,12 @@
 
 namespace NQRVZEP20::zep {
 
-namespace {
-
 bool IsSet(ICIMClass const& cls, std::string const& qualifierName) {
   auto const qualifier = cls.GetQualifier(qualifierName, TCIMContext());
   return qualifier && !(qualifier->GetValue(TCIMContext()) == TCIMValue(false));
 }
+
+namespace {
 
 // Adds classes that come after their superclasses.
 class TCollector {

@@ -17,6 +17,9 @@ struct TClassEntry {
   std::size_t fDepth;  // how many classes are above it
 };
 
+// Whether the class itself carries the qualifier, with any value but false.
+bool IsSet(ICIMClass const& cls, std::string const& qualifierName);
+
 // Every class of the namespace, each below its superclass.
 std::vector<TClassEntry> ClassesOf(ICIMNamespace const& ns);
 

@@ -15,6 +15,7 @@
 #include <CLI/CLI.hpp>
 
 #include <memory>
+#include <unordered_set>
 
 namespace NQRVZEP20::zep {
 
@@ -32,14 +33,17 @@ struct TCount {
   std::size_t fCount = 0;
 };
 
-// How much of each kind of thing a namespace has.
+// How much of each kind of thing a namespace has. Of the classes nothing is kept but the names of the indications: a schema
+// may have very many.
 class TCensus {
 public:
   explicit TCensus(ICIMNamespace const& ns) {
     ns.EnumerateQualifierDecls([&](auto const&) { return ++fQualifierDecls.fCount, true; }, TCIMContext());
-    for (TClassEntry const& entry : ClassesOf(ns)) CountClass(entry);
+    auto const countClass = [&](boost::shared_ptr<ICIMClass> cls) { return CountClass(*cls), true; };
     ns.EnumerateClasses(
         [&](boost::shared_ptr<ICIMClass> root) {
+          CountClass(*root);
+          root->EnumerateSubClasses(countClass, TCIMContext());
           root->EnumerateInstances([&](auto const&) { return ++fInstances.fCount, true; }, TCIMContext());
           return true;
         },
@@ -51,13 +55,13 @@ public:
   }
 
 private:
-  void CountClass(TClassEntry const& entry) {
+  void CountClass(ICIMClass const& cls) {
     ++fClasses.fCount;
-    fAssociations.fCount += entry.fIsAssociation;
-    fIndications.fCount += entry.fIsIndication;
-    fAbstract.fCount += entry.fIsAbstract;
-    entry.fClass->EnumeratePropertyDecls([&](auto const&) { return ++fProperties.fCount, true; }, TCIMContext());
-    entry.fClass->EnumerateMethodDecls(
+    fAssociations.fCount += cls.GetClassFlag(TCIMContext());
+    fIndications.fCount += IsIndication(cls);
+    fAbstract.fCount += cls.IsAbstract(TCIMContext());
+    cls.EnumeratePropertyDecls([&](auto const&) { return ++fProperties.fCount, true; }, TCIMContext());
+    cls.EnumerateMethodDecls(
         [&](boost::shared_ptr<ICIMMethodDecl> method) {
           ++fMethods.fCount;
           method->EnumerateParameterDecls([&](auto const&) { return ++fParameters.fCount, true; }, TCIMContext());
@@ -66,6 +70,16 @@ private:
         TCIMContext());
   }
 
+  // Its superclass, if any, was asked before.
+  bool IsIndication(ICIMClass const& cls) {
+    auto const superClass = cls.GetSuperClass(TCIMContext());
+    bool const isBelowOne = superClass && fIndicationNames.count(superClass->GetName(TCIMContext())) != 0;
+    if (!isBelowOne && !IsSet(cls, "Indication")) return false;
+    fIndicationNames.insert(cls.GetName(TCIMContext()));
+    return true;
+  }
+
+  std::unordered_set<std::string> fIndicationNames;
   TCount fQualifierDecls{"qualifierDeclarations", "Qualifier declarations"};
   TCount fClasses{"classes", "Classes"};
   TCount fAssociations{"associations", "  associations"};
