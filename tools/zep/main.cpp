@@ -11,6 +11,7 @@
 
 #include <algorithm>
 #include <cctype>
+#include <csignal>
 #include <exception>
 #include <iostream>
 #include <map>
@@ -203,6 +204,10 @@ void WriteFailure(std::string const& document, std::exception const& failure) {
   if (!why.empty()) std::cerr << "zep: " << Printable(why) << '\n';
 }
 
+// A caller that ignores SIGCHLD, as some services do, passes that on, and the result of no child could be had. SIGPIPE stays as
+// the caller has it (Output.h).
+void SetSignals() { std::signal(SIGCHLD, SIG_DFL); }
+
 int RunOrFail(std::vector<std::string> const& words) {
   CLI::App app("zep tells what a server knows of itself, through the provider plug-ins beside libzepcore.so.", "zep");
   TRuns const runs = AddCommands(app);
@@ -219,4 +224,7 @@ int RunOrFail(std::vector<std::string> const& words) {
 
 }  // namespace NQRVZEP20::zep
 
-int main(int argc, char** argv) { return NQRVZEP20::zep::RunOrFail({argv + 1, argv + argc}); }
+int main(int argc, char** argv) {
+  NQRVZEP20::zep::SetSignals();
+  return NQRVZEP20::zep::RunOrFail({argv + 1, argv + argc});
+}

@@ -109,6 +109,23 @@ TEST_F(ZepMediaTest, MountsAndUnmounts) {
             "zep: nothing is mounted at /mnt/key\nexit status 1\n");
 }
 
+TEST_F(ZepMediaTest, MountsForACallerThatIgnoresItsChildren) {
+  MakeImage(dir_.Path("key"), "whole");
+  EXPECT_EQ(WithZep([&] {
+              TLoopDevice const loop(dir_.Path("key"));
+              std::string text;
+              for (std::vector<std::string> const& arguments :
+                   {std::vector<std::string>{"media", "mount", loop.Path()}, {"media", "umount", "/mnt/key"}}) {
+                TCall call = {arguments};
+                call.ignoresChildren = true;
+                TRun const run = installation_->Run(call);
+                text += run.output + run.errors;
+              }
+              return Replaced(text, loop.Path(), "LOOP");
+            }),
+            "LOOP is mounted at /mnt/key\n/mnt/key is unmounted; the medium can be taken out\n");
+}
+
 TEST_F(ZepMediaTest, MakesTheMountPointAndPrintsJson) {
   MakeImage(dir_.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {

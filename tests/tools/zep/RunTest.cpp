@@ -73,6 +73,15 @@ TEST_F(RunTest, TellsThatACommandFailed) {
   EXPECT_EQ(run.errors, "zep: /nonexistent" + reason);
 }
 
+// The system hands the choice on to zep, and would take the children's results.
+TEST_F(RunTest, ACallerThatIgnoresItsChildrenMakesNoDifference) {
+  TCall call = {{"run", "echo", "done"}};
+  call.ignoresChildren = true;
+  TRun const run = zep_.Run(call);
+  EXPECT_EQ(run.status, 0) << run.errors;
+  EXPECT_EQ(run.output, "done\n");
+}
+
 TEST_F(RunTest, TheTimeoutIsOneOfSilence) {
   EXPECT_EQ(Run({"--timeout", "3", "sh", "-c", "sleep 1; echo a; sleep 1; echo b; sleep 1; echo c; sleep 1"}).output,
             "a\nb\nc\n");

@@ -29,6 +29,7 @@ struct TCall {
   std::map<std::string, std::string> environment = {};
   bool asNobody = false;            // as a user without privileges
   bool ignoresBrokenPipes = false;  // with SIGPIPE ignored, as some callers leave it
+  bool ignoresChildren = false;     // the same with SIGCHLD
   std::string outputFile = {};      // instead of one that is read back
   int outputDescriptor = -1;        // the same, as an open descriptor
   std::string directory = {};       // to work in
@@ -82,6 +83,7 @@ private:
     if (!call.directory.empty() && ::chdir(call.directory.c_str()) != 0) ::_exit(126);
     if (call.hasNoTerminal) ::setsid();
     std::signal(SIGPIPE, call.ignoresBrokenPipes ? SIG_IGN : SIG_DFL);
+    std::signal(SIGCHLD, call.ignoresChildren ? SIG_IGN : SIG_DFL);
     for (char const* name : {"ZEP_SMBIOS_TABLE", "ZEP_HOST_NAME", "ZEP_BMC_PASSWORD", "LD_LIBRARY_PATH"}) ::unsetenv(name);
     ::setenv("ZEP_SCSI_DEVICES", Path("no-scsi-devices").c_str(), 1);  // whatever this machine has
     for (auto const& [name, value] : call.environment) ::setenv(name.c_str(), value.c_str(), 1);
