@@ -9,6 +9,7 @@
 #include "Password.h"
 #include "Processes.h"
 #include "TLogger.h"
+#include "Terminal.h"
 #include "Text.h"
 
 #include <fcntl.h>
@@ -53,7 +54,7 @@ std::vector<std::string> HostsIn(std::string const& path) {
 // The line on standard error that tells how far a list is. On a terminal it is written over and over, elsewhere once.
 class TProgress {
 public:
-  explicit TProgress(std::size_t hosts) : fHosts(hosts), fIsTerminal(::isatty(STDERR_FILENO) == 1) {}
+  explicit TProgress(std::size_t hosts) : fHosts(hosts), fIsTerminal(CanRedrawErrors()) {}
 
   void Count(bool isFailure) {
     ++fDone;

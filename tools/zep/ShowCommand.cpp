@@ -134,7 +134,7 @@ std::string DescriptionOf(ICIMClass const& cls) {
   std::istringstream paragraphs(description);
   std::string text;
   for (std::string paragraph; std::getline(paragraphs, paragraph);)
-    for (std::string const& line : Wrapped(Printable(paragraph), kLineWidth)) text += line + "\n";
+    for (std::string const& line : Wrapped(Printable(paragraph), OutputWidth())) text += line + "\n";
   return text + "\n";
 }
 
@@ -147,7 +147,7 @@ std::string ValuesAsText(ICIMClass const& cls, std::vector<boost::shared_ptr<ICI
     for (auto const& [entry, word] : words.Entries()) values += (values.empty() ? "" : ", ") + entry + " (" + word + ")";
     if (!values.empty()) table.Add({property.GetName(TCIMContext()), values});
   });
-  return table.GetText().empty() ? "" : "\nValues\n" + table.GetText();
+  return table.IsEmpty() ? "" : "\nValues\n" + table.GetText();
 }
 
 std::string SignatureOf(ICIMMethodDecl const& method) {
@@ -182,7 +182,7 @@ std::vector<boost::shared_ptr<ICIMMethodDecl>> MethodsOf(std::vector<boost::shar
 std::string MethodsAsText(std::vector<boost::shared_ptr<ICIMClass const>> const& lineage) {
   std::string text;
   for (auto const& method : MethodsOf(lineage))
-    for (std::string const& line : Wrapped(Printable(SignatureOf(*method)), kLineWidth)) text += line + "\n";
+    for (std::string const& line : Wrapped(Printable(SignatureOf(*method)), OutputWidth())) text += line + "\n";
   return text.empty() ? "" : "\nMethods\n" + text;
 }
 

@@ -4,6 +4,8 @@
 #include <cmath>
 #include <cstdio>
 #include <iterator>
+#include <numeric>
+#include <optional>
 
 namespace NQRVZEP20::zep {
 
@@ -64,14 +66,67 @@ std::string WithEscaped(std::string_view text, TIsToBeEscaped isToBeEscaped) {
 
 std::string WithoutTrailingBlanks(std::string_view text) { return std::string(text.substr(0, text.find_last_not_of(' ') + 1)); }
 
-// Where to break a text that is wider than `width`: behind that many characters, or at the last blank before.
+// Looks at no more of the text than it has to.
+bool IsWiderThan(std::string_view text, std::size_t width) {
+  std::size_t characters = 0;
+  for (char const c : text)
+    if ((static_cast<unsigned char>(c) & 0xc0) != 0x80 && ++characters > width) return true;
+  return false;
+}
+
+// Where to break a text that is wider than `width`: at the last blank that leaves no more than that, else within the word.
 std::size_t BreakOf(std::string_view text, std::size_t width) {
   std::size_t end = 0;
   for (std::size_t characters = 0; characters < width; ++characters)
     end += std::max<std::size_t>(FirstOf(text.substr(end)).size, 1);
-  if (text[end] == ' ') return end;
-  std::size_t const blank = text.substr(0, end).find_last_of(' ');
-  return blank == std::string_view::npos || blank == 0 ? end : blank;
+  std::size_t const blank = text.find_last_of(' ', end);
+  return blank != text.npos && text.find_first_not_of(' ') < blank ? blank : end;
+}
+
+// ---- Columns ----
+
+constexpr std::size_t kGap = 2;  // between two columns
+
+using TWidths = std::vector<std::size_t>;
+
+// Blanks at the start belong to the first word.
+std::size_t LongestWordIn(std::string_view cell) {
+  std::size_t longest = 0, start = 0;
+  std::size_t word = std::min(cell.find_first_not_of(' '), cell.size());
+  while (start < cell.size()) {
+    std::size_t const end = std::min(cell.find(' ', word), cell.size());
+    longest = std::max(longest, WidthOf(cell.substr(start, end - start)));
+    start = word = std::min(cell.find_first_not_of(' ', end), cell.size());
+  }
+  return longest;
+}
+
+std::size_t LineWidthOf(TWidths const& widths) {
+  return std::accumulate(widths.begin(), widths.end(), kGap * (widths.size() - 1));
+}
+
+// The column in which the first number exceeds the second by most; none when it does so in no column.
+std::optional<std::size_t> WidestDifference(TWidths const& more, TWidths const& less) {
+  std::optional<std::size_t> widest;
+  for (std::size_t at = 0; at < more.size(); ++at)
+    if (more[at] > less[at] && (!widest || more[at] - less[at] > more[*widest] - less[*widest])) widest = at;
+  return widest;
+}
+
+void Narrow(TWidths& widths, TWidths const& needed, std::size_t lineWidth) {
+  while (LineWidthOf(widths) > lineWidth) {
+    auto const column = WidestDifference(widths, needed);
+    if (!column) return;
+    --widths[*column];
+  }
+}
+
+void Widen(TWidths& widths, TWidths const& wanted, std::size_t lineWidth) {
+  while (LineWidthOf(widths) < lineWidth) {
+    auto const column = WidestDifference(wanted, widths);
+    if (!column) return;
+    ++widths[*column];
+  }
 }
 
 }  // namespace
@@ -91,7 +146,7 @@ std::size_t WidthOf(std::string_view text) {
 
 std::vector<std::string> Wrapped(std::string_view text, std::size_t width) {
   std::vector<std::string> lines;
-  while (WidthOf(text) > width) {
+  while (IsWiderThan(text, width)) {
     std::size_t const end = BreakOf(text, width);
     lines.push_back(WithoutTrailingBlanks(text.substr(0, end)));
     text.remove_prefix(end);
@@ -125,22 +180,51 @@ std::string ExactSizeText(std::uint64_t bytes) {
 }
 
 void TTable::Add(std::vector<std::string> const& cells) {
-  std::vector<std::vector<std::string>> columns;
-  std::size_t height = 0;
-  for (std::size_t at = 0; at < cells.size(); ++at) {
-    columns.push_back(Wrapped(Printable(cells[at]), fWidths[at]));
-    height = std::max(height, columns.back().size());
-  }
-  for (std::size_t row = 0; row < height; ++row) {
-    std::string line;
-    std::size_t column = 0;  // where the next cell begins
-    for (std::size_t at = 0; at < columns.size(); ++at) {
-      std::string const cell = row < columns[at].size() ? columns[at][row] : "";
-      if (!cell.empty()) line.append(column - WidthOf(line), ' ').append(cell);
-      column += fWidths[at] + 2;
+  std::vector<std::string> row;
+  for (std::string const& cell : cells) row.push_back(Printable(cell));
+  fRows.push_back(std::move(row));
+}
+
+std::vector<std::size_t> TTable::WidthsFor(ELayout layout, std::size_t lineWidth) const {
+  TWidths needed(fWidths.size()), whole(fWidths.size());
+  for (auto const& row : fRows)
+    for (std::size_t at = 0; at < row.size(); ++at) {
+      // One that would take more than three quarters of the line is cut rather.
+      std::size_t const longest = LongestWordIn(row[at]);
+      if (longest <= lineWidth / 4 * 3) needed[at] = std::max(needed[at], longest);
+      whole[at] = std::max(whole[at], WidthOf(row[at]));
     }
-    fText += line + "\n";
+  if (layout == ELayout::kPlain) return whole;
+
+  TWidths widths = fWidths;
+  for (std::size_t at = 0; at < widths.size(); ++at) widths[at] = std::max(widths[at], needed[at]);
+  Narrow(widths, needed, lineWidth);
+  if (layout == ELayout::kTerminal) Widen(widths, whole, lineWidth);
+  return widths;
+}
+
+std::string TTable::TextFor(ELayout layout, std::size_t lineWidth) const {
+  TWidths const widths = WidthsFor(layout, lineWidth);
+  std::string text;
+  for (auto const& row : fRows) {
+    std::vector<std::vector<std::string>> cells;
+    std::size_t height = 0;
+    for (std::size_t at = 0; at < row.size(); ++at) {
+      cells.push_back(Wrapped(row[at], widths[at]));
+      height = std::max(height, cells.back().size());
+    }
+    for (std::size_t number = 0; number < height; ++number) {
+      std::string line;
+      std::size_t column = 0;  // where the next cell begins
+      for (std::size_t at = 0; at < cells.size(); ++at) {
+        std::string const cell = number < cells[at].size() ? cells[at][number] : "";
+        if (!cell.empty()) line.append(column - WidthOf(line), ' ').append(cell);
+        column += widths[at] + kGap;
+      }
+      text += line + "\n";
+    }
   }
+  return text;
 }
 
 }  // namespace NQRVZEP20::zep

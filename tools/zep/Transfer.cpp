@@ -5,6 +5,7 @@
 #include "Output.h"
 #include "Sha256.h"
 #include "TOSSpecific.h"
+#include "Terminal.h"
 #include "Text.h"
 
 #include <fcntl.h>
@@ -35,7 +36,7 @@ std::string ReasonOf(int error) { return std::generic_category().message(error);
 // One line on the terminal of standard error, written over and over, and gone at the end.
 class TProgress {
 public:
-  TProgress(std::uint64_t total, bool isWanted) : fTotal(total), fIsShown(isWanted && ::isatty(STDERR_FILENO)) {}
+  TProgress(std::uint64_t total, bool isWanted) : fTotal(total), fIsShown(isWanted && CanRedrawErrors()) {}
   ~TProgress() {
     if (fIsShown) std::cerr << "\r\x1b[K" << std::flush;
   }

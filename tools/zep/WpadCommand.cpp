@@ -8,9 +8,9 @@
 #include "PacFile.h"
 #include "ProxySearch.h"
 #include "TOSSpecific.h"
+#include "Terminal.h"
 #include "Text.h"
 
-#include <unistd.h>
 #include <CLI/CLI.hpp>
 
 #include <algorithm>
@@ -75,7 +75,7 @@ public:
     if (fWidth > 0) std::cerr << '\r' << std::string(fWidth, ' ') << '\r' << std::flush;
   }
   void Show(TAsking const& asking, int secondsLeft) {
-    if (::isatty(STDERR_FILENO) == 0) return;
+    if (!CanRedrawErrors()) return;
     std::string text = "Waiting for an answer to " + asking.fAddress + ": " + std::to_string(secondsLeft) + " s left";
     text.resize(std::max(text.size(), fWidth), ' ');
     fWidth = text.size();

@@ -69,6 +69,7 @@ TEST(TextTest, LongTextsAreBrokenAtBlanks) {
   EXPECT_THAT(Wrapped("one two three", 6), ElementsAre("one", "two", "three"));
   EXPECT_THAT(Wrapped("1234567890", 4), ElementsAre("1234", "5678", "90"));
   EXPECT_THAT(Wrapped("a 1234567890", 4), ElementsAre("a", "1234", "5678", "90"));
+  EXPECT_THAT(Wrapped("   ", 1), ElementsAre(""));
   EXPECT_THAT(Wrapped("a    b", 2), ElementsAre("a", "b"));
   EXPECT_THAT(Wrapped("ends in blanks   ", 14), ElementsAre("ends in blanks"));
   EXPECT_THAT(Wrapped("\xc3\xa9\xc3\xa9\xc3\xa9", 2), ElementsAre("\xc3\xa9\xc3\xa9", "\xc3\xa9"));
@@ -87,6 +88,47 @@ TEST(TextTest, ATableKeepsItsColumns) {
             "long    v         y\n"
             "name\n"
             "b                 z\n");
+}
+
+TEST(TextTest, AColumnIsAsWideAsItsLongestWord) {
+  TTable table({6, 8, 62});
+  table.Add({"Name", "Value", "By"});
+  table.Add({"ConfiguredMemoryClockSpeed", "v", "x"});
+  std::string const blanks(22, ' ');
+  EXPECT_EQ(table.GetText(), "Name" + blanks + "  Value     By\nConfiguredMemoryClockSpeed  v         x\n");
+}
+
+TEST(TextTest, ColumnsGiveWhatTheyDoNotNeed) {
+  TTable table({4, 20});
+  table.Add({"1234567890", "one two three four"});
+  EXPECT_EQ(table.TextFor(ELayout::kFile, 26), "1234567890  one two three\n            four\n");
+  EXPECT_EQ(table.TextFor(ELayout::kFile, 20), "1234567890  one two\n            three\n            four\n");
+}
+
+TEST(TextTest, AWordThatTakesMostOfTheLineIsCut) {
+  TTable table({4, 10, 4});
+  table.Add({"a", "12345678901234567890", "b"});
+  table.Add({"c", "1234567890 12345", "d"});
+  EXPECT_EQ(table.TextFor(ELayout::kFile, 24),
+            "a     1234567890  b\n"
+            "      1234567890\n"
+            "c     1234567890  d\n"
+            "      12345\n");
+}
+
+TEST(TextTest, ATerminalGivesWideColumnsWhatItHas) {
+  TTable table({6, 8});
+  table.Add({"one two", "three four five six"});
+  EXPECT_EQ(table.TextFor(ELayout::kFile, 80), "one     three\ntwo     four\n        five six\n");
+  EXPECT_EQ(table.TextFor(ELayout::kTerminal, 22), "one     three four\ntwo     five six\n");
+  EXPECT_EQ(table.TextFor(ELayout::kTerminal, 80), "one two  three four five six\n");
+}
+
+TEST(TextTest, OnADumbTerminalARowIsOneLine) {
+  TTable table({6, 8});
+  table.Add({"one two", "three four five six"});
+  table.Add({"a", "b"});
+  EXPECT_EQ(table.TextFor(ELayout::kPlain, 20), "one two  three four five six\na        b\n");
 }
 
 TEST(TextTest, CellsAreMadePrintable) {
