@@ -26,6 +26,10 @@ need_packages() {
   fi
   local as_root=()
   [[ $(id -u) == 0 ]] || as_root=(sudo)
+  if [[ ${#as_root[@]} -gt 0 ]] && ! command -v sudo >/dev/null; then
+    echo "Packages are missing that only root can install, and there is no sudo. As root: apt-get install ${missing[*]}" >&2
+    return 1
+  fi
   echo "Installing what is missing: ${missing[*]}"
   "${as_root[@]}" apt-get update -qq
   "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive apt-get install -y -qq --no-install-recommends "${missing[@]}" >/dev/null

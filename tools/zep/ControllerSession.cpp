@@ -33,7 +33,8 @@ constexpr TReason kReasons[] = {
     {7, "the account may not be administrator, or there is no cipher suite in common"},
     {8, "the user name or the password cannot be used; it may be too long"},
     {10, "it did not carry a command out"},
-    {kZEPStatusFileSystemError, "libipmiClient.so cannot be loaded, or has no memory left"},  // 11
+    {kZEPStatusFileSystemError,
+     "libipmiClient.so cannot be loaded (install the package libzepcore-ipmi), or has no memory left"},  // 11
     {12, "its answers make no sense"},
     {kZEPStatusNotFound, "libipmiClient.so lacks a function"},  // 15
 };

@@ -156,7 +156,8 @@ std::vector<TMedium> FindMedia() {
   std::vector<std::string> const arguments = {"--json", "--bytes", "--paths", "--output",
                                               "NAME,TYPE,SIZE,LABEL,FSTYPE,RM,RO,TRAN,MOUNTPOINTS,VENDOR,MODEL"};
   if (TOSSpecific::SpawnProcess("lsblk", arguments, output, kTimeoutSeconds) != 0)
-    throw std::runtime_error(output.empty() ? "lsblk cannot be run" : "lsblk failed: " + output.substr(0, output.find('\n')));
+    throw std::runtime_error(output.empty() ? "lsblk cannot be run, or fails and says nothing; the package util-linux has it"
+                                            : "lsblk failed: " + output.substr(0, output.find('\n')));
   std::vector<TMedium> media = MediaIn(output);
   media.erase(std::remove_if(media.begin(), media.end(), IsEmptyDrive), media.end());
 

@@ -54,7 +54,8 @@ bool Load(TCurl& curl, std::string& failure) {
                        Find(library, "curl_global_cleanup", curl.fGlobalCleanup);
   if (isWhole) return true;
   char const* const reason = ::dlerror();
-  failure = std::string("libcurl cannot be loaded: ") + (reason != nullptr ? reason : "no reason given");
+  failure = std::string("libcurl cannot be loaded: ") + (reason != nullptr ? reason : "no reason given") +
+            (library == nullptr ? "; install the package libcurl4" : "");
   return false;
 }
 

@@ -187,6 +187,7 @@ bool Include(TAsking asking, TSearch& search, TOnWait const& onWait) {
 
 std::string WhyNoListening() {
   int const error = ErrorOfListening();
+  if (error == EACCES || error == EPERM) return "zep wpad needs root: nobody else may listen on port 68";
   return error == 0 || error == EADDRINUSE ? "" : std::string("port 68 cannot be listened on: ") + std::strerror(error);
 }
 

@@ -309,11 +309,18 @@ TReport MakeReport(std::vector<TPlugIn> plugIns) {
 
 std::string WhyNotComplete(TReport const& report) {
   if (report.fStatus == kExitComplete) return "";
-  std::vector<std::string> unknown;
-  for (TReportRow const& row : report.fIdentity)
-    if (!row.fAnswer.fIsKnown) unknown.push_back(row.fLabel);
-  std::vector<std::string> reasons = FailuresOf(report.fPlugIns);
-  if (!unknown.empty()) reasons.insert(reasons.begin(), "unknown: " + Joined(unknown, ", "));
+  std::vector<std::string> reasons;
+  std::string last;  // of the row before: rows with the same reason share it
+  for (TReportRow const& row : report.fIdentity) {
+    TAnswer const& answer = row.fAnswer;
+    if (answer.fIsKnown || answer.IsNotApplicable()) continue;
+    if (!reasons.empty() && answer.fMissing.fReason == last)
+      reasons.back().insert(reasons.back().size() - last.size() - 2, ", " + row.fLabel);
+    else
+      reasons.push_back(row.fLabel + ": " + answer.fMissing.fReason);
+    last = answer.fMissing.fReason;
+  }
+  for (std::string const& failure : FailuresOf(report.fPlugIns)) reasons.push_back(failure);
   return Joined(reasons, "; ");
 }
 

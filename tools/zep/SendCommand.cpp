@@ -21,6 +21,10 @@ struct TArguments {
 int Send(TArguments const& arguments) {
   if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the file comes first, and where it goes behind it");
   TTarget const target = TargetOf(arguments.fTarget, arguments.fBySftp);
+  std::string const& path = target.fRemote.fPath;
+  bool const isNamed = !path.empty() && path.back() != '/';
+  if (isNamed && !arguments.fName.empty())
+    throw TWrongUsage("the URL names the file already; --as is for a host or a URL that ends in \"/\"");
   TTransferred const sent = SendFile(arguments.fFile, target, arguments.fName, arguments.fOptions);
   return TellOf(sent, "zep send", arguments.fAsJson, arguments.fOptions);
 }

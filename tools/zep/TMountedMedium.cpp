@@ -12,6 +12,8 @@
 
 #include <cerrno>
 #include <cstdio>
+#include <cstdlib>
+#include <sstream>
 #include <stdexcept>
 #include <system_error>
 
@@ -62,11 +64,21 @@ void RefuseStranger(std::string const& device) {
     Throw(device + " is not mounted: " + next + ", which would be tried as well, is no partition of it");
 }
 
+// The library runs it by the shell, and takes its absence for a medium that cannot be read.
+void NeedProgram(std::string const& name) {
+  char const* const path = std::getenv("PATH");
+  std::istringstream directories(path != nullptr ? path : "");
+  for (std::string directory; std::getline(directories, directory, ':');)
+    if (::access((directory + "/" + name).c_str(), X_OK) == 0) return;
+  Throw("the program " + name + " is missing; install the package mount");
+}
+
 TMount MountOrThrow(std::string const& device, std::string const& mountPoint) {
   std::optional<TMount> const present = MountAt(mountPoint);
   RefuseOther(present, mountPoint, device);
   if (!present) RefuseStranger(device);
   if (!TOSSpecific::IsAdmin()) Throw("only root can mount " + device);
+  NeedProgram("mount");
   try {
     if (!TOSSpecific::DirExists(mountPoint)) TOSSpecific::CreateDir(mountPoint);
   } catch (TZEPException const& failure) {
@@ -144,6 +156,7 @@ std::vector<std::string> UnmountDirectory(std::string const& directory) {
   std::optional<TMount> const mount = MountAt(directory);
   if (!mount) Throw("nothing is mounted at " + directory);
   if (!TOSSpecific::IsAdmin()) Throw("only root can unmount " + directory);
+  NeedProgram("umount");
 
   TDrives const drives = DrivesOf(*mount);
   // Opened before: it then tells of what could not be written while unmounting.

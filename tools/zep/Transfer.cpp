@@ -7,6 +7,7 @@
 #include "TOSSpecific.h"
 #include "Terminal.h"
 #include "Text.h"
+#include "Unreachable.h"
 
 #include <fcntl.h>
 #include <linux/fs.h>
@@ -72,6 +73,15 @@ TOutcome Transfer(std::function<TZEPStatusCode()> const& transfer, TTransferred 
   TWatch watch{transferred.fFile, isUpload, password, options.fStallSeconds, {}};
   watch.fShowProgress = [&progress](std::uint64_t bytes) { progress.Show(bytes); };
   return RunWatched(transfer, watch);
+}
+
+// Says more of a connection that failed than the library does: which of the ways it was.
+void ExplainNoConnection(TOutcome& outcome, TRemote const& remote) {
+  constexpr int kProbeSeconds = 3;
+  if (outcome.fExit != kExitNoConnection) return;
+  std::string const usualPort = remote.fScheme == "sftp" ? "22" : "21";
+  std::string const why = WhyUnreachable(remote.fHost, remote.fPort.empty() ? usualPort : remote.fPort, kProbeSeconds);
+  if (!why.empty()) outcome.fReason += ": " + Printable(why);
 }
 
 TTransferred TransferOf(TRemote const& remote, std::string const& file) {
@@ -283,6 +293,7 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
   FindPassword(target.fRemote, options.fNetrc);
   transferred.fUrl = ShownUrlOf(PlaceOf(target));
   transferred.fOutcome = Transfer([&] { return Send(file, target); }, transferred, target.fRemote.fPassword, true, options);
+  ExplainNoConnection(transferred.fOutcome, target.fRemote);
   if (transferred.fOutcome.fExit != kExitComplete) {
     bool const wasReached = transferred.fOutcome.fExit == kExitNothing || transferred.fOutcome.fExit == kExitStalled;
     if (wasReached) transferred.fOutcome.fReason += "; the server may have a part of it";
@@ -303,6 +314,7 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
   if (!lock.WhyNotHad().empty()) return Failed(transferred, kExitNotWritten, lock.WhyNotHad());
   if (!MakeRoomFor(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
   transferred.fOutcome = Transfer([&] { return Fetch(UrlOf(remote), part); }, transferred, remote.fPassword, false, options);
+  ExplainNoConnection(transferred.fOutcome, remote);
   if (transferred.fOutcome.fExit != kExitComplete) return BrokenOff(transferred);
   return Completed(transferred, file, overwrites);
 }

@@ -121,6 +121,12 @@ std::string Without(std::string const& secret, std::string text) {
   return text;
 }
 
+// Where libcurl itself is missing, and not a function of it, the package that has it is named.
+std::string RemedyFor(std::string const& reason) {
+  bool const isMissing = reason.find("Error opening curl library: ") != reason.npos;
+  return isMissing ? "; install the package libcurl4" : "";
+}
+
 bool EndsWith(std::string const& text, std::string const& end) {
   return text.size() >= end.size() && text.compare(text.size() - end.size(), end.size(), end) == 0;
 }
@@ -132,6 +138,7 @@ TOutcome OutcomeOf(std::string const& report, TWatch const& watch) {
   if (status == kZEPStatusOK) return {status, kExitComplete, ""};
   std::string reason = Printable(Without(watch.fSecret, report.substr(blank + 1)));
   if (EndsWith(reason, ": ")) reason += "libcurl does not tell why";
+  reason += RemedyFor(reason);
   return {status, ExitStatusOf(status), reason.empty() ? status.TranslateStatusCode() : reason};
 }
 

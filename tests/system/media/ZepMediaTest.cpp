@@ -126,6 +126,18 @@ TEST_F(ZepMediaTest, MountsForACallerThatIgnoresItsChildren) {
             "LOOP is mounted at /mnt/key\n/mnt/key is unmounted; the medium can be taken out\n");
 }
 
+TEST_F(ZepMediaTest, WithoutTheProgramMountThePackageIsNamed) {
+  MakeImage(dir_.Path("key"), "whole");
+  EXPECT_EQ(WithZep([&] {
+              TLoopDevice const loop(dir_.Path("key"));
+              TCall call = {{"media", "mount", loop.Path()}};
+              call.environment = {{"PATH", dir_.Path()}};
+              TRun const run = installation_->Run(call);
+              return run.errors + std::to_string(run.status);
+            }),
+            "zep: the program mount is missing; install the package mount\n1");
+}
+
 TEST_F(ZepMediaTest, MakesTheMountPointAndPrintsJson) {
   MakeImage(dir_.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {

@@ -72,7 +72,9 @@ protected:
   std::map<std::string, std::string> const password_ = {{"ZEP_BMC_PASSWORD", "zeppass1"}};
 };
 
-std::string const kNothing = "no session with its controller after N s: libipmiClient.so cannot be loaded, or has no memory left";
+std::string const kNothing =
+    "no session with its controller after N s: libipmiClient.so cannot be loaded (install the package libzepcore-ipmi), or has "
+    "no memory left";
 
 TEST_F(ZepRemoteTest, WithoutTheClientLibraryNothingIsTold) {
   TRun const run = Run({"192.0.2.1", "--user", "zepadmin"}, password_);
@@ -204,7 +206,7 @@ TEST_F(ZepRemoteTest, WhyThereIsNoSessionIsToldInWords) {
       {"8", "the user name or the password cannot be used; it may be too long"},
       {"9", "code 9 of libipmiClient.so"},
       {"10", "it did not carry a command out"},
-      {"11", "libipmiClient.so cannot be loaded, or has no memory left"},
+      {"11", "libipmiClient.so cannot be loaded (install the package libzepcore-ipmi), or has no memory left"},
       {"12", "its answers make no sense"},
       {"-7", "code -7 of libipmiClient.so"},
       {"4711", "code 4711 of libipmiClient.so"},

@@ -288,7 +288,7 @@ TEST_F(MediaCommandTest, SaysWhatIsWrongWithLsblk) {
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: lsblk failed: lsblk: no sysfs\n");
   AddStandIn("lsblk", "exit 1");
-  EXPECT_EQ(Run({}).errors, "zep: lsblk cannot be run\n");
+  EXPECT_EQ(Run({}).errors, "zep: lsblk cannot be run, or fails and says nothing; the package util-linux has it\n");
   AddStandIn("lsblk", "echo usage");
   run = Run({});
   EXPECT_EQ(run.status, 1);

@@ -34,6 +34,8 @@ TEST(RunWatchedTest, WhatATransferThrowsIsTheOutcome) {
        "Error connecting to Server"},
       {Thrown(kZEPStatusLibCurlFailure, "TOSSpecific|CurlTransferFile: Error initalizing curl"), kExitNoLibrary,
        "Error initalizing curl"},
+      {Thrown(kZEPStatusLibCurlFailure, "TOSSpecific|CurlTransferFile: Error opening curl library: x"), kExitNoLibrary,
+       "Error opening curl library: x; install the package libcurl4"},
       {Thrown(kZEPStatusAccessDenied, "TOSSpecific|CurlTransferFile: Error performing command: a\x1b[1m topsecret b"),
        kExitNothing, "Error performing command: a\\x1b[1m *** b"},
       {Thrown(kZEPStatusFail, "of another kind: x"), kExitNothing, "of another kind: x"},

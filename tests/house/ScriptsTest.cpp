@@ -1,0 +1,50 @@
+// What the scripts say where they cannot go on.
+
+#include "tests/Support.h"
+#include "tests/os/Programs.h"
+
+#include <gmock/gmock.h>
+
+namespace NQRVZEP20 {
+namespace {
+
+namespace fs = std::filesystem;
+
+class ScriptsTest : public testing::Test {
+protected:
+  // A program that the scripts find: a script of one line.
+  void Program(std::string const& name, std::string const& line) {
+    WriteFile(dir_.Path(name), "#!/bin/bash\n" + line + "\n");
+    fs::permissions(dir_.Path(name), fs::perms::owner_all);
+  }
+
+  // scripts/lib.sh and a function of it, with no programs but those of the test, sed and dirname.
+  TProgramRun Run(std::string const& function) {
+    for (char const* program : {"sed", "dirname", "grep"})
+      fs::create_symlink(std::string("/usr/bin/") + program, dir_.Path(program));
+    return RunProgram("PATH=" + dir_.Path() + " /bin/bash -c 'set -euo pipefail; source " ZEP_SOURCE_DIR "/scripts/lib.sh; " +
+                      function + "' 2>&1");
+  }
+
+  TTempDir dir_;
+};
+
+TEST_F(ScriptsTest, PackagesThatOnlyRootCanInstallAreNamedWhereThereIsNoSudo) {
+  Program("id", "echo 1000");
+  Program("dpkg-query", "exit 1");
+  TProgramRun const run = Run("need_packages build");
+  EXPECT_EQ(run.exitCode, 1);
+  EXPECT_THAT(run.output, testing::StartsWith("Packages are missing that only root can install, and there is no sudo. "
+                                              "As root: apt-get install cmake "));
+  EXPECT_EQ(run.output.find("command not found"), std::string::npos) << run.output;
+}
+
+TEST_F(ScriptsTest, WithSudoThePackagesAreInstalled) {
+  Program("id", "echo 1000");
+  Program("dpkg-query", "exit 1");
+  Program("sudo", "echo sudo \"$1\" >&2");
+  EXPECT_THAT(Run("need_packages build").output, testing::HasSubstr("sudo apt-get\nsudo env\n"));
+}
+
+}  // namespace
+}  // namespace NQRVZEP20
