@@ -109,5 +109,39 @@ TEST_F(SessionTest, AMessageThatIsTooLongForVersion15IsRefusedAndTheSessionGoesO
   EXPECT_EQ(relay_->Requests().size(), before + 1) << "in the same session";
 }
 
+// ---- What the simulator cannot do ----
+
+TEST(EnvelopeTest, BothCipherSuitesCarryAMessageAndNoDamagedOne) {
+  struct TRow {
+    char const* name;
+    ipmi::TCipherSuite suite;
+    unsigned keySize;
+  };
+  TRow const rows[] = {{"3", {1, 1, 1}, 20}, {"17", {3, 4, 1}, 32}};
+  ASSERT_EQ(::ipmi_rmcpplus_init(), 0);
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.name);
+    ipmi::TKeys keys{};
+    keys.size = row.keySize;
+    keys.integrity.fill(1);
+    keys.confidentiality.fill(2);
+    ipmi::TEnvelope2 controllers(row.suite, keys, 1, 2), clients(row.suite, keys, 2, 1);
+    ipmi::TPacket const packet = controllers.Pack({0x0B, 9, 0x11, {0, 'd', 'a', 't', 'a'}});
+    ipmi::TReply reply;
+    ASSERT_EQ(clients.Unpack(packet, reply), ipmi::EVerdict::kAnswer);
+    EXPECT_EQ(reply.sequence, 9);
+    EXPECT_EQ(reply.command, 0x11);
+    EXPECT_EQ(reply.data, (ipmi::TByteVector{'d', 'a', 't', 'a'}));
+    clients.Accept(reply);
+    EXPECT_EQ(clients.Unpack(packet, reply), ipmi::EVerdict::kOther) << "a copy";
+    constexpr std::size_t kFirstSigned = 4;  // behind the header of RMCP
+    for (std::size_t place = kFirstSigned; place < packet.size(); ++place) {
+      ipmi::TPacket damaged = packet;
+      damaged[place] ^= 1;
+      EXPECT_NE(ipmi::TEnvelope2(row.suite, keys, 2, 1).Unpack(damaged, reply), ipmi::EVerdict::kAnswer) << place;
+    }
+  }
+}
+
 }  // namespace
 }  // namespace NQRVZEP20
