@@ -12,6 +12,7 @@
 #include <pthread.h>
 #include <sys/stat.h>
 
+#include <atomic>
 #include <chrono>
 #include <climits>
 #include <cstring>
@@ -365,6 +366,27 @@ TEST_F(TLoggerTest, InitializeMakesTheDirectoryAndOpensTheNamedFile) {
   TLogger logger;
   EXPECT_EQ(logger.Initialize("zep"), kZEPStatusOK);
   EXPECT_EQ(ReadFile(Path("a/b/c/zep.log")), kOpenBanner);
+}
+
+TEST_F(TLoggerTest, ThreadsMayInitializeAtOnceInANewDirectory) {
+  constexpr int kRounds = 1200;
+  std::atomic<int> failures{0};
+  for (int round = 0; round < kRounds; ++round) {
+    TLogger::SetLogFileDir(Path(std::to_string(round) + "/logs/"));
+    std::atomic<int> ready{0};
+    auto const initialize = [&](char const* name) {
+      for (++ready; ready < 2;) std::this_thread::yield();
+      try {
+        TLogger::GetInstance()->Initialize(name);
+      } catch (TZEPException const&) {
+        ++failures;
+      }
+    };
+    std::thread first(initialize, "first"), second(initialize, "second");
+    first.join();
+    second.join();
+  }
+  EXPECT_EQ(failures, 0);
 }
 
 TEST_F(TLoggerTest, InitializePutsNoSeparatorBetweenDirectoryAndName) {
