@@ -33,6 +33,10 @@ public:
 
   // Ends, by the command "kill", every process whose line in the output of "ps -e" holds "dhclient". What the command says
   // lands in a file /dev/nul; where that cannot be made, as without root's rights, nothing is ended.
+  //
+  // The lines are taken as they are. A "ps" that prints a name with a line break as two lines, as BusyBox does, lets any user
+  // make a line with any number, and root then ends that process. A caller with root's rights looks first whether the number
+  // before each such line is that of a process whose /proc/PID/comm holds "dhclient" (docs/security.md).
   static void wpadPreconfig();
 
   // The DHCPINFORM message about an interface with that address (IPv4 or IPv6) and hardware address, kMessageSize bytes made

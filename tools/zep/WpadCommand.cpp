@@ -2,6 +2,7 @@
 
 #include "AutoProxyDiscovery.h"
 #include "Commands.h"
+#include "DhcpClients.h"
 #include "ExitStatus.h"
 #include "Json.h"
 #include "Output.h"
@@ -48,15 +49,10 @@ std::vector<std::string> LinesOf(std::string const& text) {
   return lines;
 }
 
-void TellWhatWillHappen() {
+void TellWhatWillHappen(std::vector<std::string> const& clients) {
   std::cerr << "This ends the DHCP clients of this machine: every process with \"dhclient\" in its line of \"ps -e\".\n";
-  bool isAny = false;
-  for (std::string const& line : LinesOf(TOSSpecific::SpawnProcess("ps", {"-e"}, 300))) {
-    if (line.find("dhclient") == std::string::npos) continue;
-    std::cerr << "  " << Printable(line) << "\n";
-    isAny = true;
-  }
-  if (!isAny) std::cerr << "  (none runs now)\n";
+  for (std::string const& line : clients) std::cerr << "  " << Printable(line) << "\n";
+  if (clients.empty()) std::cerr << "  (none runs now)\n";
 }
 
 bool IsConfirmed() {
@@ -177,10 +173,17 @@ std::string AsJson(TFindings const& findings) {
 
 // ---- The steps ----
 
-// False, with the clients left alone, when the user does not want it.
+// False, with the clients left alone, when the user does not want it. Throws std::runtime_error when a process that is none would
+// be ended: the library looks for itself, but at the same list.
 bool StopClients(bool isConfirmed) {
-  TellWhatWillHappen();
+  std::vector<std::string> const clients = DhcpClientLines();
+  TellWhatWillHappen(clients);
+  std::string const why = WhyNotToBeEnded(clients);
+  if (!why.empty()) throw std::runtime_error(why);
   if (!isConfirmed && !IsConfirmed()) return false;
+  // Again: the answer may have taken its time.
+  std::string const whyNow = WhyNotToBeEnded(DhcpClientLines());
+  if (!whyNow.empty()) throw std::runtime_error(whyNow);
   AutoProxyDiscovery::wpadPreconfig();
   return true;
 }

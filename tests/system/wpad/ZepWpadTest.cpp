@@ -103,6 +103,28 @@ TEST_F(ZepWpadTest, YesIsSaidOnTheCommandLine) {
   EXPECT_EQ(run.errors.find("Go on?"), std::string::npos) << run.errors;
 }
 
+// A name with a line break in it is two lines for BusyBox.
+std::string const kForgedLine =
+    "mkdir $TMPDIR/bin && ln -s $(command -v busybox) $TMPDIR/bin/ps && export PATH=$TMPDIR/bin:$PATH; "
+    "sleep 100 & victim=$!; "
+    "python3 -c 'import ctypes, sys, time; ctypes.CDLL(None).prctl(15, b\"\\n%d dhclient\" % int(sys.argv[1])); time.sleep(100)' "
+    "$victim & until ps -e | grep -q \"^ *$victim dhclient\"; do sleep 0.02; done; ";
+std::string const kDoesItLive = "; echo $?; kill -0 $victim && echo lives";
+
+TEST_F(ZepWpadTest, ALineThatNamesAnotherProcessIsRefused) {
+  std::string const settings = "TMPDIR=" + dir_.Path() + " ";
+  for (std::string const command : {"$ZEP wpad --yes", "echo y | $ZEP wpad"}) {
+    std::filesystem::remove_all(dir_.Path("bin"));
+    TRun const run = Zep(settings, kForgedLine + command + kDoesItLive);
+    EXPECT_EQ(run.output, "1\nlives\n");
+    EXPECT_NE(
+        std::regex_search(run.errors, std::regex("zep: the line \" *[0-9]+ dhclient.*\" of \"ps -e\" is wrong: process [0-9]+ "
+                                                 "is \"sleep\"\\. Nothing was ended; --no-stop leaves the DHCP clients alone\n")),
+        false)
+        << run.errors;
+  }
+}
+
 TEST_F(ZepWpadTest, DhcpClientsAreLeftAloneWhenAsked) {
   TRun const run = Zep("WPAD_DHCLIENT=1", kOnceItRuns + "$ZEP wpad --no-stop" + kIsItThere);
   EXPECT_EQ(LinesOf(run.output).front(), "http://wpad.test/wpad.dat");
