@@ -67,16 +67,20 @@ std::string OrUnknown(std::string const& field) { return field.empty() ? "unknow
 
 }  // namespace
 
+bool IsHostName(std::string const& host) { return host.find('@') == host.npos; }
+
 std::string AskController(std::string const& host, TAccount const& account) {
+  if (!IsHostName(host)) return std::string(3, kEnd) + kNoHostName + kEnd;
   auto const start = TClock::now();
   std::string const why = WhyNoSession(host, account);
   if (!why.empty()) return WithoutASession(start, why);
-  std::string const answer = TOSSpecific::GetRemoteMT(host, account.fUser, account.fPassword);
+  std::string const password = account.fPassword.ForLibrary();
+  std::string const answer = TOSSpecific::GetRemoteMT(host, account.fUser, password);
   if (answer.empty()) return WithoutASession(start, "it gave one, but not a second time");
   std::vector<TField> const fields = {
       {"machine type", answer},
-      {"model", TOSSpecific::GetRemoteMachineModel(host, account.fUser, account.fPassword)},
-      {"serial number", TOSSpecific::GetRemoteMSN(host, account.fUser, account.fPassword)},
+      {"model", TOSSpecific::GetRemoteMachineModel(host, account.fUser, password)},
+      {"serial number", TOSSpecific::GetRemoteMSN(host, account.fUser, password)},
   };
   IIPMILan::GetInstance()->IpmilanCloseConnect();
 

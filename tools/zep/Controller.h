@@ -1,13 +1,15 @@
 #pragma once
 
 #include "Json.h"
+#include "TSecret.h"
 
 #include <string>
 
 namespace NQRVZEP20::zep {
 
 struct TAccount {
-  std::string fUser, fPassword;
+  std::string fUser;
+  TSecret fPassword;
 };
 
 // What a remote server's controller tells of it.
@@ -16,6 +18,10 @@ struct TRemoteIdentity {
   std::string fType, fModel, fSerialNumber;  // empty: not told
   std::string fError;                        // why something was not told; empty when all was
 };
+
+// Whether it may be the name or the address of a host: "user:secret@host" is neither.
+bool IsHostName(std::string const& host);
+constexpr char const* kNoHostName = "a host has no \"@\"; --user names the account, and its password does not belong there";
 
 // Asks the controller; to be called in a process of its own. The result is for IdentityFrom.
 std::string AskController(std::string const& host, TAccount const& account);

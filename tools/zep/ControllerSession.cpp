@@ -101,7 +101,8 @@ std::string WhyNoSession(std::string const& host, TAccount const& account) {
   std::thread([&] {
     TDebugLines const lines;
     FailureOf([&] { TLogger::GetInstance()->SetLogFilename(log.Path()); });
-    failure = FailureOf([&] { isOpen = IIPMILan::GetInstance()->IpmilanOpenConnect(host, account.fUser, account.fPassword); });
+    std::string const password = account.fPassword.ForLibrary();
+    failure = FailureOf([&] { isOpen = IIPMILan::GetInstance()->IpmilanOpenConnect(host, account.fUser, password); });
   }).join();
   if (isOpen) return "";
   if (!failure.empty()) return failure;

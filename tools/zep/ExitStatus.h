@@ -14,7 +14,12 @@ enum EExitStatus {
   kExitNoConnection = 68,  // the host is unknown, or nobody answers there
   kExitNoLibrary = 69,     // there is no libcurl, or none that will do
   kExitNotWritten = 73,    // the local file is there already, or cannot be written
-  kExitStalled = 75        // nothing moved any more
+  kExitStalled = 75,       // nothing moved any more
+
+  // In documents only: zep dies of the signal that interrupted it, which a shell shows as this number.
+  kExitHangUp = 129,
+  kExitInterrupt = 130,
+  kExitTermination = 143
 };
 
 // For programs: what it says of what was asked for. Every failure is "nothing".

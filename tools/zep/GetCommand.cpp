@@ -2,6 +2,7 @@
 
 #include "Commands.h"
 #include "Failure.h"
+#include "Interrupts.h"
 #include "Text.h"
 #include "Transfer.h"
 
@@ -71,6 +72,7 @@ int Get(TArguments const& arguments) {
   fs::file_status const status = fs::symlink_status(file, unknown);
   std::string const why = WhyNotWritten(arguments, file, status);
   if (!why.empty()) return Refuse(source.fRemote, file, why, arguments.fAsJson);
+  TInterruptGuard const guard;
   bool const overwrites = fs::exists(status) || arguments.fForce;
   TTransferred const fetched = GetFile(source.fRemote, file, overwrites, arguments.fOptions);
   return TellOf(fetched, "zep get", arguments.fAsJson, arguments.fOptions);
@@ -85,13 +87,15 @@ TRun AddGetArguments(CLI::App& command) {
   CLI::Option* const force = command.add_flag("--force", arguments->fForce, "Overwrite the file without asking");
   command.add_flag("--no-clobber", arguments->fNoClobber, "Leave a file that is there as it is, without asking")->excludes(force);
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  AddSizeOption(command, "--max-size", arguments->fOptions.fMostBytes,
+                "The most bytes that are fetched (10 GiB), such as 500K, 2M or 1G; 0: no limit");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
       "A file that is there is overwritten after a question, which is asked on a terminal only; of a symbolic link the file "
       "that\n"
       "it leads to. Until all has arrived the file bears \".part\" behind its name; what arrived of a broken transfer keeps "
       "that\n"
-      "name.\n" +
+      "name, and the next one goes on with it where the server allows that and the file there is still the same.\n" +
       TransferHelp());
   return [arguments] { return Get(*arguments); };
 }

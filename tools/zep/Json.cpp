@@ -5,6 +5,7 @@
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
 #include "Sample.h"
+#include "Secrets.h"
 #include "Text.h"
 #include "ValueWords.h"
 
@@ -49,6 +50,21 @@ TJson PropertyAsJson(TNamespaceView const& view, ICIMInstance const& instance, I
   return json;
 }
 
+// In a message, though not in data, "user:secret@host" has a password.
+bool IsMessage(std::string const& key) { return key == "reason" || key == "error" || key == "failure"; }
+
+TJson WithoutSecretsIn(TJson json, bool isMessage = false) {
+  if (json.is_string()) {
+    auto const text = json.get<std::string>();
+    return isMessage ? MessageWithoutSecrets(text) : WithoutSecrets(text);
+  }
+  if (json.is_object())
+    for (auto& [key, value] : json.items()) value = WithoutSecretsIn(std::move(value), IsMessage(key));
+  else if (json.is_array())
+    for (TJson& value : json) value = WithoutSecretsIn(std::move(value), isMessage);
+  return json;
+}
+
 }  // namespace
 
 TJson DocumentHead(std::string const& what, EExitStatus status, std::string const& reason) {
@@ -59,9 +75,13 @@ TJson DocumentHead(std::string const& what, EExitStatus status, std::string cons
   return document;
 }
 
-std::string AsText(TJson const& document) { return document.dump(2, ' ', false, TJson::error_handler_t::replace) + "\n"; }
+std::string AsText(TJson const& document) {
+  return WithoutSecretsIn(document).dump(2, ' ', false, TJson::error_handler_t::replace) + "\n";
+}
 
-std::string AsLine(TJson const& document) { return document.dump(-1, ' ', false, TJson::error_handler_t::replace) + "\n"; }
+std::string AsLine(TJson const& document) {
+  return WithoutSecretsIn(document).dump(-1, ' ', false, TJson::error_handler_t::replace) + "\n";
+}
 
 TJson OrNull(std::string const& text) { return text.empty() ? TJson(nullptr) : TJson(text); }
 

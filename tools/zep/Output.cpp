@@ -1,5 +1,7 @@
 #include "Output.h"
 
+#include "Secrets.h"
+
 #include <unistd.h>
 
 #include <cerrno>
@@ -17,7 +19,8 @@ bool gHasWrittenOutput = false;
 
 void WriteOutput(std::string const& text) {
   gHasWrittenOutput = true;
-  if (!WriteWhole(STDOUT_FILENO, text))
+  bool const isDocument = !text.empty() && text.front() == '{';
+  if (!WriteWhole(STDOUT_FILENO, isDocument ? text : WithoutSecrets(text)))
     throw std::system_error(errno, std::generic_category(), "standard output cannot be written");
 }
 

@@ -6,8 +6,9 @@
 
 namespace NQRVZEP20::zep {
 
-// Writes the text to standard output, whole. Throws std::system_error when that fails, as on a full disk; a reader who
-// went away ends the program by SIGPIPE, unless the caller of zep has that signal ignored.
+// Writes the text to standard output, whole but for passwords (WithoutSecrets). A JSON document, which begins with "{", has lost
+// them already (AsText). Throws std::system_error when that fails, as on a full disk; a reader who went away ends the program by
+// SIGPIPE, unless the caller of zep has that signal ignored.
 void WriteOutput(std::string const& text);
 
 // Whether WriteOutput was called: with --json a document is printed then, in part at least.

@@ -1,17 +1,13 @@
 #include "PacFile.h"
 
-#include "TOSSpecific.h"
+#include "Curl.h"
+#include "Text.h"
 
-// The limits to plain HTTP are set as every libcurl knows them; newer ones have another way as well.
-#define CURL_DISABLE_DEPRECATION
-#include <curl/curl.h>
-#include <dlfcn.h>
 #include <strings.h>
 
 #include <array>
 #include <cstring>
 #include <memory>
-#include <vector>
 
 namespace NQRVZEP20::zep {
 
@@ -19,51 +15,18 @@ namespace {
 
 constexpr std::size_t kMostBytes = 1 << 20;
 
-// The functions of libcurl that are used; libcurl.so is loaded, never linked.
-struct TCurl {
-  std::unique_ptr<void, int (*)(void*)> fLibrary{nullptr, ::dlclose};
-  decltype(curl_global_init)* fGlobalInit = nullptr;
-  decltype(curl_easy_init)* fInit = nullptr;
-  decltype(curl_easy_setopt)* fSetOption = nullptr;
-  decltype(curl_easy_perform)* fPerform = nullptr;
-  decltype(curl_easy_cleanup)* fCleanup = nullptr;
-  decltype(curl_global_cleanup)* fGlobalCleanup = nullptr;
+// What has come, and whether that was too much.
+struct TPage {
+  std::string& fText;
+  bool fIsTooLong = false;
 };
 
-std::vector<std::string> LibraryNames() {
-  std::string const root = TOSSpecific::GetZEPRootPath();
-  return {root + "/libcurl.so", root + "/libcurl.so.4", "libcurl.so", "libcurl.so.4", "libcurl.so.3", "libcurl.so.2"};
-}
-
-template <class TFunction>
-bool Find(void* library, char const* name, TFunction*& function) {
-  function = reinterpret_cast<TFunction*>(::dlsym(library, name));
-  return function != nullptr;
-}
-
-// False, with the loader's reason, when there is no libcurl that can be used.
-bool Load(TCurl& curl, std::string& failure) {
-  for (std::string const& name : LibraryNames()) {
-    curl.fLibrary.reset(::dlopen(name.c_str(), RTLD_LAZY));
-    if (curl.fLibrary) break;
-  }
-  void* const library = curl.fLibrary.get();
-  bool const isWhole = library != nullptr && Find(library, "curl_global_init", curl.fGlobalInit) &&
-                       Find(library, "curl_easy_init", curl.fInit) && Find(library, "curl_easy_setopt", curl.fSetOption) &&
-                       Find(library, "curl_easy_perform", curl.fPerform) && Find(library, "curl_easy_cleanup", curl.fCleanup) &&
-                       Find(library, "curl_global_cleanup", curl.fGlobalCleanup);
-  if (isWhole) return true;
-  char const* const reason = ::dlerror();
-  failure = std::string("libcurl cannot be loaded: ") + (reason != nullptr ? reason : "no reason given") +
-            (library == nullptr ? "; install the package libcurl4" : "");
-  return false;
-}
-
 // libcurl's write callback. What is too long is refused, which ends the transfer.
-std::size_t Append(char const* bytes, std::size_t size, std::size_t count, void* text) {
-  std::string& all = *static_cast<std::string*>(text);
-  if (all.size() + size * count > kMostBytes) return 0;
-  all.append(bytes, size * count);
+std::size_t Append(char const* bytes, std::size_t size, std::size_t count, void* context) {
+  TPage& page = *static_cast<TPage*>(context);
+  page.fIsTooLong = page.fText.size() + size * count > kMostBytes;
+  if (page.fIsTooLong) return 0;
+  page.fText.append(bytes, size * count);
   return size * count;
 }
 
@@ -85,9 +48,11 @@ std::string Transfer(TCurl const& curl, std::string const& url, std::string& tex
   curl.fSetOption(handle, CURLOPT_TIMEOUT, 30L);
   curl.fSetOption(handle, CURLOPT_NOSIGNAL, 1L);
   curl.fSetOption(handle, CURLOPT_WRITEFUNCTION, &Append);
-  curl.fSetOption(handle, CURLOPT_WRITEDATA, &text);
+  TPage page{text};
+  curl.fSetOption(handle, CURLOPT_WRITEDATA, &page);
   CURLcode const code = curl.fPerform(handle);
   if (code == CURLE_OK) return "";
+  if (page.fIsTooLong) return "it is larger than " + ExactSizeText(kMostBytes);
   return error[0] != '\0' ? error.data() : "libcurl ends with code " + std::to_string(code);
 }
 
@@ -102,7 +67,10 @@ TPacFile FetchPacFile(std::string const& url) {
     return file;
   }
   TCurl curl;
-  if (!Load(curl, file.fFailure)) return file;
+  if (!Load(curl, file.fFailure)) {
+    file.fFailure = "libcurl cannot be loaded: " + file.fFailure + (curl.fLibrary ? "" : "; install the package libcurl4");
+    return file;
+  }
   if (curl.fGlobalInit(CURL_GLOBAL_ALL) != CURLE_OK) {
     file.fFailure = "libcurl does not start";
     return file;

@@ -1,6 +1,9 @@
 #include "Password.h"
 
 #include "Descriptor.h"
+#include "Interrupts.h"
+#include "PrivateFile.h"
+#include "Secrets.h"
 #include "Text.h"
 
 #include <fcntl.h>
@@ -13,7 +16,6 @@
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
-#include <fstream>
 #include <optional>
 #include <stdexcept>
 
@@ -23,20 +25,20 @@ namespace {
 
 constexpr char const* kVariable = "ZEP_BMC_PASSWORD";
 
-std::string PasswordIn(std::string const& path) {
-  errno = 0;
-  std::ifstream file(path);
-  std::string line;
-  bool const isThere = static_cast<bool>(std::getline(file, line));
-  if (!isThere && errno != 0) throw std::runtime_error(path + " cannot be read: " + std::strerror(errno));
-  if (!isThere) throw std::runtime_error("there is no password in " + path);
-  if (!line.empty() && line.back() == '\r') line.pop_back();
-  return line;
+TSecret PasswordIn(std::string const& path) {
+  TPrivateFile const file(path);
+  std::string const name = NameOfPrivateFile(path, "--password-file");
+  if (file.Error() != 0) throw std::runtime_error(name + " cannot be read: " + std::strerror(file.Error()));
+  if (file.Text().empty()) throw std::runtime_error("there is no password in " + name);
+  file.WarnWhenOthersMayRead();
+  std::string_view line = file.Text().substr(0, file.Text().find('\n'));
+  if (!line.empty() && line.back() == '\r') line.remove_suffix(1);
+  return TSecret(line);
 }
 
-std::string TakeOutOfTheEnvironment() {
-  std::string password = std::getenv(kVariable);
-  ::unsetenv(kVariable);
+// The value of the variable, as it was at the start of the program.
+std::optional<TSecret>& PasswordOfEnvironment() {
+  static std::optional<TSecret> password;
   return password;
 }
 
@@ -85,11 +87,11 @@ public:
     return waiting[1].revents == 0;
   }
 
-  std::string ReadLine() const {
-    std::string line;
+  TSecret ReadLine() const {
+    TSecretBytes line;
     for (char c = 0; ::read(fFile.Get(), &c, 1) == 1;) {
-      if (c == '\n') return line;
-      line += c;
+      if (c == '\n') return TSecret({line.data(), line.size()});
+      line.push_back(c);
     }
     throw std::runtime_error("no password was given");
   }
@@ -100,24 +102,38 @@ private:
 };
 
 // Nothing when a signal came, which has its effect before this returns.
-std::optional<std::string> AskOnce(std::string const& owner, std::string const& otherwise) {
+std::optional<TSecret> AskOnce(std::string const& owner, std::string const& otherwise) {
   TSignalsLater const signals;
   TQuietTerminal const terminal(otherwise);
-  terminal.Write("Password of " + Printable(owner) + ": ");
+  terminal.Write("Password of " + Printable(MessageWithoutSecrets(owner)) + ": ");
   return terminal.IsLineTypedBefore(signals) ? std::optional(terminal.ReadLine()) : std::nullopt;
 }
 
 }  // namespace
 
-std::string TypedPassword(std::string const& owner, std::string const& otherwise) {
-  std::optional<std::string> password;
-  while (!password) password = AskOnce(owner, otherwise);  // again when zep was stopped and goes on
+void TakePasswordOutOfTheEnvironment() {
+  std::size_t const length = std::strlen(kVariable);
+  for (char** entry = environ; entry != nullptr && *entry != nullptr; ++entry) {
+    if (std::strncmp(*entry, kVariable, length) != 0 || (*entry)[length] != '=') continue;
+    char* const value = *entry + length + 1;
+    if (!PasswordOfEnvironment()) PasswordOfEnvironment() = TSecret(value);  // the first counts, as for getenv
+    Wipe(value, std::strlen(value));
+  }
+  ::unsetenv(kVariable);
+}
+
+TSecret TypedPassword(std::string const& owner, std::string const& otherwise) {
+  std::optional<TSecret> password;
+  while (!password) {  // again when zep was stopped and goes on
+    password = AskOnce(owner, otherwise);
+    ThrowIfInterrupted();
+  }
   return *password;
 }
 
-std::string ControllerPassword(std::string const& user, std::string const& file) {
+TSecret ControllerPassword(std::string const& user, std::string const& file) {
   if (!file.empty()) return PasswordIn(file);
-  if (std::getenv(kVariable) != nullptr) return TakeOutOfTheEnvironment();
+  if (PasswordOfEnvironment()) return *PasswordOfEnvironment();
   return TypedPassword(user, "set ZEP_BMC_PASSWORD or use --password-file");
 }
 

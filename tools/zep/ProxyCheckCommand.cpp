@@ -2,7 +2,9 @@
 
 #include "Commands.h"
 #include "Failure.h"
+#include "Interrupts.h"
 #include "Output.h"
+#include "Secrets.h"
 #include "TOSSpecific.h"
 #include "TScratchDirectory.h"
 #include "Text.h"
@@ -14,7 +16,6 @@
 #include <fstream>
 #include <iostream>
 #include <memory>
-#include <sstream>
 
 namespace NQRVZEP20::zep {
 
@@ -23,11 +24,14 @@ namespace {
 struct TArguments {
   std::string fProxy;
   bool fAsJson = false;
+  std::uint64_t fMostBytes = 1 << 20;
   TTransferOptions fOptions;
 };
 
-std::string FirstLineOf(std::string const& text) {
+// Passwords are hidden before the text is cut, which might cut one.
+std::string FirstLineOf(std::string const& whole) {
   constexpr std::size_t kLongest = 200;
+  std::string const text = WithoutSecrets(whole);
   return Printable(text.substr(0, std::min(kLongest, text.find_first_of("\r\n"))));
 }
 
@@ -40,22 +44,47 @@ std::string AnswerIn(std::string const& page) {
   return "what came back is entitled: " + FirstLineOf(page.substr(title + start.size(), end - title - start.size()));
 }
 
+// A file of any size, of which no more than a piece is in memory at a time.
+bool HoldsText(std::string const& file, std::string const& text) {
+  std::ifstream stream(file, std::ios::binary);
+  std::string piece, chunk(65536, '\0');
+  while (stream.read(chunk.data(), static_cast<std::streamsize>(chunk.size())), stream.gcount() > 0) {
+    piece.append(chunk, 0, static_cast<std::size_t>(stream.gcount()));
+    if (piece.find(text) != piece.npos) return true;
+    piece.erase(0, piece.size() - std::min(piece.size(), text.size() - 1));  // the end may be a beginning of it
+  }
+  return false;
+}
+
+std::string BeginningOf(std::string const& file) {
+  std::string text(65536, '\0');
+  std::ifstream stream(file, std::ios::binary);
+  stream.read(text.data(), static_cast<std::streamsize>(text.size()));
+  text.resize(static_cast<std::size_t>(stream.gcount()));
+  return text;
+}
+
+bool IsCutAt(std::string const& file, std::uint64_t mostBytes) {
+  std::error_code absent;
+  return mostBytes > 0 && std::filesystem::file_size(file, absent) >= mostBytes && !absent;
+}
+
 // Something may come back from the proxy itself: its refusal, or that it cannot reach the page. So the page has to be the one.
-TOutcome Check(TRemote const& proxy, TTransferOptions const& options) {
+TOutcome Check(TRemote const& proxy, TArguments const& arguments) {
   TScratchDirectory const scratch("zep-proxy-check");  // the library writes the page into the working directory
   std::string const pageFile = scratch.Path("content.html");
-  TWatch const watch{pageFile, false, proxy.fPassword, options.fStallSeconds, {}};
+  TWatch const watch{pageFile, nullptr, arguments.fOptions.fStallSeconds, arguments.fMostBytes, {}};
   TOutcome outcome = RunWatched(
       [&] {
         std::filesystem::current_path(scratch.Path());
         return TOSSpecific::CheckProxySetting(proxy.fHost, proxy.fPort, UserAndPasswordOf(proxy), 0);
       },
       watch);
-  if (outcome.fExit != kExitComplete) return outcome;
-  std::ostringstream page;
-  page << std::ifstream(pageFile).rdbuf();
-  if (page.str().find(ZEP_PROXY_CHECK_TEXT) != std::string::npos) return outcome;
-  return {kZEPStatusAccessDenied, kExitNothing, "the page did not come through; " + AnswerIn(page.str())};
+  bool const isCut = outcome.fExit == kExitNothing && IsCutAt(pageFile, arguments.fMostBytes);
+  if (outcome.fExit != kExitComplete && !isCut) return outcome;
+  if (HoldsText(pageFile, ZEP_PROXY_CHECK_TEXT)) return {};
+  std::string const size = isCut ? ", and is larger than " + ExactSizeText(arguments.fMostBytes) + " (--max-page)" : "";
+  return {kZEPStatusAccessDenied, kExitNothing, "the page did not come through; " + AnswerIn(BeginningOf(pageFile)) + size};
 }
 
 int Tell(std::string const& proxy, TOutcome const& outcome, bool asJson, bool quiet) {
@@ -77,8 +106,9 @@ int ProxyCheck(TArguments const& arguments) {
   if (proxy.fScheme != "http" || !proxy.fPath.empty()) throw TWrongUsage("a proxy is [USER@]HOST:PORT");
   if (proxy.fPort.empty()) throw TWrongUsage("the port of the proxy is missing");
   FindPassword(proxy, arguments.fOptions.fNetrc);
-  return Tell(Printable(proxy.fHost + ":" + proxy.fPort), Check(proxy, arguments.fOptions), arguments.fAsJson,
-              arguments.fOptions.fQuiet);
+  HideLogin(proxy.fUser, proxy.fPassword.View());
+  TInterruptGuard const guard;
+  return Tell(Printable(proxy.fHost + ":" + proxy.fPort), Check(proxy, arguments), arguments.fAsJson, arguments.fOptions.fQuiet);
 }
 
 }  // namespace
@@ -87,6 +117,8 @@ TRun AddProxyCheckArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command.add_option("proxy", arguments->fProxy, "[USER@]HOST:PORT")->required();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  AddSizeOption(command, "--max-page", arguments->fMostBytes,
+                "The most bytes of the page that are fetched (1 MiB), such as 500K or 2M; 0: no limit");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
       "A web page is fetched through the proxy; the check is passed when it is that page which comes back.\n"

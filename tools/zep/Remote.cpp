@@ -2,67 +2,21 @@
 
 #include "Failure.h"
 #include "Password.h"
+#include "PrivateFile.h"
 #include "Text.h"
+#include "UrlCoding.h"
 
 #include <unistd.h>
 
-#include <cctype>
+#include <algorithm>
 #include <cerrno>
 #include <cstdlib>
-#include <fstream>
 #include <string_view>
 #include <system_error>
 
 namespace NQRVZEP20::zep {
 
 namespace {
-
-bool IsUnreserved(char c) {
-  return std::isalnum(static_cast<unsigned char>(c)) || std::string_view("-._~").find(c) != std::string_view::npos;
-}
-
-bool IsHexDigit(char c) { return std::isxdigit(static_cast<unsigned char>(c)) != 0; }
-
-// Every character but the unreserved ones and those of `others` as "%2F".
-std::string Encoded(std::string_view text, std::string_view others) {
-  constexpr char const* kDigits = "0123456789ABCDEF";
-  std::string encoded;
-  for (char const c : text) {
-    if (IsUnreserved(c) || others.find(c) != others.npos) {
-      encoded += c;
-      continue;
-    }
-    auto const byte = static_cast<unsigned char>(c);
-    (encoded += '%') += kDigits[byte >> 4];
-    encoded += kDigits[byte & 15];
-  }
-  return encoded;
-}
-
-bool IsEscape(std::string_view text, std::size_t at) {
-  return text[at] == '%' && at + 2 < text.size() && IsHexDigit(text[at + 1]) && IsHexDigit(text[at + 2]);
-}
-
-// The same, but "%2F" in the text stays as it is.
-std::string EncodedPath(std::string_view text) {
-  std::string encoded;
-  for (std::size_t i = 0; i < text.size(); ++i) {
-    bool const isEscape = IsEscape(text, i);
-    encoded += isEscape ? text.substr(i, 3) : Encoded(text.substr(i, 1), "/!$&'()*+,=:@");
-    if (isEscape) i += 2;
-  }
-  return encoded;
-}
-
-std::string Decoded(std::string_view text) {
-  std::string decoded;
-  for (std::size_t i = 0; i < text.size(); ++i) {
-    bool const isEscape = IsEscape(text, i);
-    decoded += isEscape ? static_cast<char>(std::stoi(std::string(text.substr(i + 1, 2)), nullptr, 16)) : text[i];
-    if (isEscape) i += 2;
-  }
-  return decoded;
-}
 
 void CheckHost(std::string const& host) {
   if (host.empty()) throw TWrongUsage("no host is named");
@@ -80,7 +34,7 @@ void CheckPort(std::string const& port) {
 void ReadUser(std::string const& text, TRemote& remote) {
   std::size_t const colon = text.find(':');
   remote.fUser = Decoded(text.substr(0, colon));
-  if (colon != text.npos) remote.fPassword = Decoded(text.substr(colon + 1));
+  if (colon != text.npos) remote.fPassword = TSecret(Decoded(std::string_view(text).substr(colon + 1)));
 }
 
 void ReadAuthority(std::string const& text, TRemote& remote) {
@@ -114,38 +68,70 @@ std::string DefaultNetrc() {
 }
 
 struct TLogin {
-  std::string fUser, fPassword;
+  std::string fUser;
+  TSecret fPassword;
 };
 
-// Reads the words behind "machine NAME" or "default", up to the next of these, which is left in `word`.
-TLogin ReadLogin(std::istream& file, std::string& word) {
-  TLogin login;
-  std::string macro;
-  while (file >> word && word != "machine" && word != "default") {
-    if (word == "login") file >> login.fUser;
-    if (word == "password") file >> login.fPassword;
-    if (word == "account") file >> macro;
+// The words of a text, one after the other, which are not copied.
+class TWords {
+public:
+  explicit TWords(std::string_view text) : fRest(text) {}
+
+  // The next word; empty at the end.
+  std::string_view Next() {
+    constexpr std::string_view kBlanks = " \t\r\n\v\f";
+    fRest.remove_prefix(std::min(fRest.find_first_not_of(kBlanks), fRest.size()));
+    return Take(std::min(fRest.find_first_of(kBlanks), fRest.size()), 0);
+  }
+  // The rest of the line.
+  std::string_view Line() { return Take(std::min(fRest.find('\n'), fRest.size()), 1); }
+  bool IsAtEnd() const { return fRest.empty(); }
+
+private:
+  std::string_view Take(std::size_t size, std::size_t behind) {
+    std::string_view const taken = fRest.substr(0, size);
+    fRest.remove_prefix(std::min(size + behind, fRest.size()));
+    return taken;
+  }
+  std::string_view fRest;
+};
+
+// Reads the words behind "machine NAME" or "default", up to the next of these, which is left in `word`. `password` is that of
+// the entry.
+std::string ReadLogin(TWords& words, std::string_view& word, std::string_view& password) {
+  std::string user;
+  password = {};
+  while (!(word = words.Next()).empty() && word != "machine" && word != "default") {
+    if (word == "login") user = words.Next();
+    if (word == "password") password = words.Next();
+    if (word == "account") words.Next();
     if (word == "macdef")
-      while (std::getline(file, macro) && !macro.empty()) {
+      while (!words.IsAtEnd() && !words.Line().empty()) {
       }  // a macro ends at an empty line
   }
-  return login;
+  return user;
 }
 
-// The first entry of the file for the host (and the user, when there is one) counts.
-TLogin LoginOf(TRemote const& remote, std::string const& netrcFile) {
-  std::ifstream file(netrcFile);
-  std::string word, machine;
-  file >> word;
-  while (file) {
-    bool const isDefault = word == "default";
-    if (word == "machine") file >> machine;
-    bool const isEntry = isDefault || word == "machine";
-    TLogin const login = ReadLogin(file, word);
-    bool const isUser = remote.fUser.empty() || login.fUser == remote.fUser;
-    if (isEntry && isUser && (isDefault || machine == remote.fHost)) return login;
+// The first entry for the host (and the user, when there is one) counts.
+TLogin LoginIn(std::string_view netrc, TRemote const& remote) {
+  TWords words(netrc);
+  for (std::string_view word = words.Next(); !word.empty();) {
+    bool const isDefault = word == "default", isMachine = word == "machine";
+    std::string_view const machine = isMachine ? words.Next() : std::string_view();
+    std::string_view password;
+    std::string const user = ReadLogin(words, word, password);
+    bool const isUser = remote.fUser.empty() || user == remote.fUser;
+    bool const isOfHost = isDefault || (isMachine && machine == remote.fHost);
+    if (isUser && isOfHost) return {user, TSecret(password)};
   }
   return {};
+}
+
+TLogin LoginOf(TRemote const& remote, std::string const& netrcFile) {
+  TPrivateFile const file(netrcFile);
+  TLogin login = LoginIn(file.Text(), remote);
+  if (!login.fPassword.IsEmpty()) file.WarnWhenOthersMayRead();
+  return login;
 }
 
 }  // namespace
@@ -166,7 +152,7 @@ TRemote RemoteOf(std::string const& text, std::string const& schemeOtherwise) {
 std::string EncodedName(std::string const& name) { return Encoded(name, "/!$&'()*+,=:@"); }
 
 std::string UserAndPasswordOf(TRemote const& remote) {
-  return Encoded(remote.fUser, "") + (remote.fPassword.empty() ? "" : ":" + Encoded(remote.fPassword, ""));
+  return Encoded(remote.fUser, "") + (remote.fPassword.IsEmpty() ? "" : ":" + Encoded(remote.fPassword.View(), ""));
 }
 
 std::string AuthorityOf(TRemote const& remote) {
@@ -178,18 +164,18 @@ std::string UrlOf(TRemote const& remote) { return remote.fScheme + "://" + Autho
 
 std::string ShownUrlOf(TRemote const& remote) {
   TRemote shown = remote;
-  shown.fPassword.clear();
+  shown.fPassword = TSecret();
   return Printable(UrlOf(shown));
 }
 
 void FindPassword(TRemote& remote, std::string const& netrcFile) {
-  if (!remote.fPassword.empty()) return;
+  if (!remote.fPassword.IsEmpty()) return;
   if (!netrcFile.empty() && ::access(netrcFile.c_str(), R_OK) != 0)
-    throw TWrongUsage(netrcFile + ": " + std::generic_category().message(errno));
+    throw TWrongUsage(NameOfPrivateFile(netrcFile, "--netrc") + ": " + std::generic_category().message(errno));
   TLogin const login = LoginOf(remote, netrcFile.empty() ? DefaultNetrc() : netrcFile);
   if (remote.fUser.empty()) remote.fUser = login.fUser;
   remote.fPassword = login.fPassword;
-  if (remote.fPassword.empty() && !remote.fUser.empty() && ::isatty(STDIN_FILENO))
+  if (remote.fPassword.IsEmpty() && !remote.fUser.empty() && ::isatty(STDIN_FILENO))
     remote.fPassword = TypedPassword(remote.fUser + " at " + remote.fHost, "write it to a netrc file");
 }
 

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "TSecret.h"
+
 #include <string>
 
 namespace NQRVZEP20::zep {
@@ -7,7 +9,8 @@ namespace NQRVZEP20::zep {
 // A place on a server. Texts are as people write them; UrlOf encodes them.
 struct TRemote {
   std::string fScheme;  // "ftp"
-  std::string fUser, fPassword;
+  std::string fUser;
+  TSecret fPassword;
   std::string fHost, fPort;  // no port: that of the scheme
   std::string fPath;         // below "/"; encoded already
 };

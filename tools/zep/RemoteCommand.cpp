@@ -2,12 +2,14 @@
 
 #include "Commands.h"
 #include "Controller.h"
+#include "Descriptor.h"
 #include "ExitStatus.h"
 #include "Failure.h"
 #include "IIPMILan.h"
 #include "Output.h"
 #include "Password.h"
 #include "Processes.h"
+#include "Secrets.h"
 #include "TLogger.h"
 #include "Terminal.h"
 #include "Text.h"
@@ -44,6 +46,7 @@ std::vector<std::string> HostsIn(std::string const& path) {
     std::size_t const first = line.find_first_not_of(" \t\r");
     if (first == line.npos || line[first] == '#') continue;
     hosts.push_back(line.substr(first, line.find_last_not_of(" \t\r") + 1 - first));
+    HideIn(hosts.back());
   }
   bool const isRead = file.is_open() && !file.bad();  // to its end
   if (!isRead) throw std::runtime_error(Printable(path) + " cannot be read: " + std::strerror(errno));
@@ -73,21 +76,31 @@ private:
   std::chrono::steady_clock::time_point fLast;
 };
 
-// Makes the file for nobody else to read, before the library opens it: it may come to hold passwords. Returns 0 or errno.
-int MakePrivate(std::string const& path) {
-  int const file = ::open(path.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600);
+// Why the open file is not one that only its owner, who is the caller, can read; empty when it is. It may come to hold
+// passwords.
+std::string WhyNotPrivate(int file) {
   struct stat status {};
-  bool const isFile = file >= 0 && ::fstat(file, &status) == 0 && S_ISREG(status.st_mode);  // and no terminal, say
-  bool const isPrivate = file >= 0 && (!isFile || ::fchmod(file, 0600) == 0);
-  int const error = isPrivate ? 0 : errno;
-  if (file >= 0) ::close(file);
-  return error;
+  if (::fstat(file, &status) != 0) return std::strerror(errno);
+  if (!S_ISREG(status.st_mode)) return "it is not a regular file";
+  if (status.st_uid != ::geteuid()) return "it belongs to another user";
+  if (status.st_nlink != 1) return "it has a second name (a hard link)";
+  if (::fchmod(file, 0600) != 0) return std::strerror(errno);
+  bool const isClosed = ::fstat(file, &status) == 0 && (status.st_mode & 0077) == 0;
+  return isClosed ? "" : "its file system lets others read it";
 }
 
+std::string WhyNotOpened(int error) {
+  if (error == ELOOP) return "it is a symbolic link";
+  return error == ENXIO ? "it is not a regular file" : std::strerror(error);
+}
+
+// The library opens the file that was looked at here, whatever the path leads to by then.
 void WriteDebugLog(std::string const& path) {
-  int const error = MakePrivate(path);
-  std::string failure = error != 0 ? std::strerror(error) : "";
-  if (error == 0) failure = FailureOf([&] { TLogger::GetInstance()->SetLogFilename(path); });
+  static TDescriptor file;  // to the end of the program
+  file = TDescriptor(::open(path.c_str(), O_WRONLY | O_CREAT | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC, 0600));
+  std::string failure = file ? WhyNotPrivate(file.Get()) : WhyNotOpened(errno);
+  std::string const sameFile = "/proc/self/fd/" + std::to_string(file.Get());
+  if (failure.empty()) failure = FailureOf([&] { TLogger::GetInstance()->SetLogFilename(sameFile); });
   if (!failure.empty()) throw std::runtime_error("the debug log " + path + " cannot be written: " + failure);
   TLogger::SetLogThreshold(ILogger::kLogDebug);
 }
@@ -132,9 +145,17 @@ int AskList(std::vector<std::string> const& hosts, TAccount const& account, TArg
   });
 }
 
+// "--user admin:secret" has a password in the wrong place.
+void HideAfterColon(std::string const& user) {
+  std::size_t const colon = user.find(':');
+  if (colon != user.npos) TSecret const hidden(std::string_view(user).substr(colon + 1));
+}
+
 int Remote(TArguments const& arguments) {
   if (arguments.fHost.empty() == arguments.fHostsFile.empty())
     throw TWrongUsage("name either a host or a file of hosts (--hosts)");
+  if (!IsHostName(arguments.fHost)) throw TWrongUsage(kNoHostName);
+  HideAfterColon(arguments.fUser);
   std::vector<std::string> const hosts =
       arguments.fHostsFile.empty() ? std::vector<std::string>() : HostsIn(arguments.fHostsFile);
   if (!arguments.fDebugLog.empty()) WriteDebugLog(arguments.fDebugLog);

@@ -1,6 +1,7 @@
 // zep report: which machine this is.
 
 #include "Commands.h"
+#include "Interrupts.h"
 #include "Json.h"
 #include "Output.h"
 #include "Report.h"
@@ -13,6 +14,7 @@
 
 #include <iostream>
 #include <memory>
+#include <optional>
 
 namespace NQRVZEP20::zep {
 
@@ -95,7 +97,9 @@ int MakeAndDeliver(TArguments const& arguments) {
   TReport const report = MakeReport(LoadPlugIns());
   EExitStatus status = report.fStatus;
   TJson document = PrintOrWrite(report, arguments);
+  std::optional<TInterruptGuard> guard;
   if (!arguments.fTarget.empty()) {
+    guard.emplace();
     TSentReport const sent = SendReport(report, target, arguments.fOptions);
     if (sent.fTransferred.fOutcome.fExit != kExitComplete) status = sent.fTransferred.fOutcome.fExit;
     AddSending(document, sent);

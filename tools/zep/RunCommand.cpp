@@ -5,6 +5,7 @@
 #include "Failure.h"
 #include "Json.h"
 #include "Output.h"
+#include "Secrets.h"
 #include "TOSSpecific.h"
 #include "Text.h"
 
@@ -47,7 +48,7 @@ int RunCommandLine(std::vector<std::string> commandLine, TArguments const& argum
   int const result =
       TOSSpecific::SpawnProcess(program, {commandLine.begin() + 1, commandLine.end()}, output, arguments.fTimeoutSeconds);
   std::string const failure = result == 0 ? "" : WhyItFailed(program, arguments.fTimeoutSeconds);
-  WriteOutput(arguments.fAsJson ? AsJson(commandLine, output, failure) : output);
+  WriteOutput(arguments.fAsJson ? AsJson(commandLine, output, failure) : WithoutSecrets(output));
   if (failure.empty()) return kExitComplete;
   std::cerr << "zep: " << Printable(failure) << "\n";
   return kExitNothing;
@@ -66,7 +67,7 @@ TRun AddRunArguments(CLI::App& command) {
   command.footer(
       "zep run [OPTIONS] [--] COMMAND [ARGUMENT]...\n"
       "What the command prints, on standard output and standard error, is printed when it has ended. A zero byte\n"
-      "cuts off the rest of the chunk in which it came.\n"
+      "cuts off the rest of the chunk in which it came. Passwords in URLs, and those that zep was given, come out as ***.\n"
       "Exit status: 0 when the command ran to its end and exited with 0, 1 when not, 64 for wrong usage.");
   return [&command, arguments] { return RunCommandLine(command.remaining(), *arguments); };
 }

@@ -2,6 +2,7 @@
 
 #include "Commands.h"
 #include "Failure.h"
+#include "Interrupts.h"
 #include "Transfer.h"
 
 #include <CLI/CLI.hpp>
@@ -25,6 +26,7 @@ int Send(TArguments const& arguments) {
   bool const isNamed = !path.empty() && path.back() != '/';
   if (isNamed && !arguments.fName.empty())
     throw TWrongUsage("the URL names the file already; --as is for a host or a URL that ends in \"/\"");
+  TInterruptGuard const guard;
   TTransferred const sent = SendFile(arguments.fFile, target, arguments.fName, arguments.fOptions);
   return TellOf(sent, "zep send", arguments.fAsJson, arguments.fOptions);
 }
@@ -42,7 +44,9 @@ TRun AddSendArguments(CLI::App& command) {
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
-      "Missing directories are made on the server; a file that is there is overwritten. A host gets the file in the directory\n"
+      "Missing directories are made on the server; a file that is there is overwritten, where the server can rename in one go\n"
+      "when all has arrived: until then the file bears \".part\" and a number behind its name. A host gets the file in the "
+      "directory\n"
       "of the user, or, when ZEP_ISBOOTABLE is \"yes\", in hostline/toqrv/vantor/fdr_upload.\n" +
       TransferHelp() + " 2 when the file changed while it was sent.");
   return [arguments] { return Send(*arguments); };

@@ -1,5 +1,7 @@
 #include "Text.h"
 
+#include "Secrets.h"
+
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
@@ -181,7 +183,7 @@ std::string ExactSizeText(std::uint64_t bytes) {
 
 void TTable::Add(std::vector<std::string> const& cells) {
   std::vector<std::string> row;
-  for (std::string const& cell : cells) row.push_back(Printable(cell));
+  for (std::string const& cell : cells) row.push_back(Printable(WithoutSecrets(cell)));
   fRows.push_back(std::move(row));
 }
 

@@ -33,7 +33,8 @@ std::string SizeText(std::uint64_t bytes);
 std::string ExactSizeText(std::uint64_t bytes);
 
 // A table with a title line and columns that are two blanks apart. A cell that is too long for its column goes on in the next
-// line; no word is cut that takes up to three quarters of a line. Cells are made printable here.
+// line; no word is cut that takes up to three quarters of a line. Cells are made printable here, and passwords in
+// them are hidden: a line that is broken in two hides none later.
 class TTable {
 public:
   // `widths`: those of the columns on a line of 80, in characters.

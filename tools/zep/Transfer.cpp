@@ -2,9 +2,9 @@
 
 #include "Descriptor.h"
 #include "Failure.h"
+#include "FileTransfer.h"
 #include "Output.h"
 #include "Sha256.h"
-#include "TOSSpecific.h"
 #include "Terminal.h"
 #include "Text.h"
 #include "Unreachable.h"
@@ -17,12 +17,17 @@
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
+#include <cctype>
 #include <cerrno>
+#include <charconv>
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
 #include <iostream>
+#include <limits>
+#include <string_view>
 
 namespace NQRVZEP20::zep {
 
@@ -67,10 +72,12 @@ private:
   std::chrono::steady_clock::time_point fStart = std::chrono::steady_clock::now();
 };
 
-TOutcome Transfer(std::function<TZEPStatusCode()> const& transfer, TTransferred const& transferred, std::string const& password,
-                  bool isUpload, TTransferOptions const& options) {
-  TProgress progress(isUpload ? transferred.fBytes : 0, !options.fQuiet);
-  TWatch watch{transferred.fFile, isUpload, password, options.fStallSeconds, {}};
+TOutcome Transfer(std::function<TZEPStatusCode()> const& transfer, TTransferState const& state, std::uint64_t total,
+                  TTransferOptions const& options) {
+  TProgress progress(total, !options.fQuiet);
+  TWatch watch;
+  watch.fMoved = &state.fMoved;
+  watch.fStallSeconds = options.fStallSeconds;
   watch.fShowProgress = [&progress](std::uint64_t bytes) { progress.Show(bytes); };
   return RunWatched(transfer, watch);
 }
@@ -94,6 +101,20 @@ TTransferred TransferOf(TRemote const& remote, std::string const& file) {
 TTransferred Failed(TTransferred transferred, EExitStatus exit, std::string const& reason) {
   transferred.fOutcome = {kZEPStatusFail, exit, reason};
   return transferred;
+}
+
+// Reads "500K" into the bytes; returns why that cannot be, or an empty text.
+std::string WhyNoSize(std::string const& text, std::uint64_t& bytes) {
+  constexpr std::string_view kUnits = "KMGT";
+  std::uint64_t number = 0;
+  auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+  std::string_view const unit(end, static_cast<std::size_t>(text.data() + text.size() - end));
+  std::size_t const power = unit.size() == 1 ? kUnits.find(static_cast<char>(std::toupper(unit[0]))) : kUnits.npos;
+  bool const isRead = error == std::errc() && (unit.empty() || power != kUnits.npos);
+  unsigned const shift = unit.empty() ? 0 : 10 * (static_cast<unsigned>(power) + 1);
+  if (!isRead || number > (std::numeric_limits<std::uint64_t>::max() >> 1 >> shift)) return "it is not a size";
+  bytes = number << shift;
+  return "";
 }
 
 bool IsSameFile(struct stat const& a, struct stat const& b) { return a.st_dev == b.st_dev && a.st_ino == b.st_ino; }
@@ -128,15 +149,17 @@ TRemote PlaceOf(TTarget const& target) {
   return place;
 }
 
-TZEPStatusCode Send(std::string const& file, TTarget const& target) {
-  std::string const host = AuthorityOf(target.fRemote);
-  if (!target.fIsHost)
-    TOSSpecific::CurlTransferFile(UrlOf(target.fRemote), file, false);
-  else if (target.fRemote.fScheme == "sftp")
-    TOSSpecific::sFTPFile(host, file, target.fRemote.fPath);
-  else
-    TOSSpecific::FTPFile(host, file, target.fRemote.fPath);
-  return kZEPStatusOK;
+// How long a server has to remove what a broken transfer left: less than a standstill takes.
+int CleanUpSecondsOf(TTransferOptions const& options) {
+  constexpr int kMost = 10;
+  return options.fStallSeconds > 0 ? std::clamp(options.fStallSeconds / 2, 1, kMost) : kMost;
+}
+
+// What is known besides of an upload that failed.
+void ExplainUpload(TOutcome& outcome, TTransferState const& state) {
+  bool const mayBeThere = outcome.fExit == kExitNothing || outcome.fExit == kExitStalled || outcome.fExit >= kExitHangUp;
+  if (state.fReadError != 0) outcome = {outcome.fStatus, kExitNoInput, ReasonOf(state.fReadError)};
+  if (mayBeThere && !state.fIsRemoved) outcome.fReason += "; the server may have a part of it";
 }
 
 // ---- Fetching ----
@@ -174,14 +197,6 @@ private:
   TDescriptor fFile;
 };
 
-// The library asks about a file that is in the way, which can only be one that somebody else has made just now: it meets the
-// end of the input, and returns without a transfer.
-TZEPStatusCode Fetch(std::string const& url, std::string const& part) {
-  std::cin.clear();
-  TOSSpecific::CurlTransferFile(url, part, true);
-  return std::cin.eof() ? kZEPStatusAlreadyExists : kZEPStatusOK;
-}
-
 // Gives the file its name, in place of another one only when that is wanted.
 bool Rename(std::string const& from, std::string const& to, bool overwrites) {
   if (overwrites) return std::rename(from.c_str(), to.c_str()) == 0;
@@ -199,10 +214,14 @@ bool MakeEmptyFile(std::string const& path) {
 bool CanGrow(std::string const& path) {
   TDescriptor const file(::open(path.c_str(), O_WRONLY | O_APPEND));
   if (!file) return errno == ENOENT;
+  struct stat before {};
+  ::fstat(file.Get(), &before);
   off_t const size = ::lseek(file.Get(), 0, SEEK_END);
   bool const isWritten = WriteWhole(file.Get(), std::string(4096, '\0'));
   int const error = errno;
   if (::ftruncate(file.Get(), size) != 0) return false;
+  timespec const times[] = {before.st_atim, before.st_mtim};
+  ::futimens(file.Get(), times);  // which may tell where it came from (MarkForResuming)
   errno = error;
   return isWritten;
 }
@@ -221,20 +240,29 @@ std::string PartText(std::string const& part) {
   return absent ? "; nothing arrived" : "; the " + SizeText(size) + " that arrived are in " + Printable(part);
 }
 
-// A part that an earlier transfer left goes: the library would ask what is to become of it. False, with errno set, when no new
-// one could be made.
-bool MakeRoomFor(std::string const& part) {
+bool IsRegularFile(std::string const& file) {
+  struct stat status {};
+  return ::lstat(file.c_str(), &status) == 0 && S_ISREG(status.st_mode);
+}
+
+// Whether a part could be written; one that an earlier transfer left stays. False, with errno set, when not.
+bool CanMakePart(std::string const& part, bool isThere) {
+  if (isThere) return static_cast<bool>(TDescriptor(::open(part.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC)));
   if (::unlink(part.c_str()) != 0 && errno != ENOENT) return false;
   if (!MakeEmptyFile(part)) return false;
   ::unlink(part.c_str());
   return true;
 }
 
-TTransferred BrokenOff(TTransferred transferred) {
+TTransferred BrokenOff(TTransferred transferred, TTransferState const& state, TTransferOptions const& options) {
   std::string const& part = transferred.fFile;
   if (transferred.fOutcome.fStatus == kZEPStatusAlreadyExists)
     return Failed(transferred, kExitNotWritten, "another program has made this file meanwhile");
-  BlameTheDisk(transferred.fOutcome, part);
+  if (state.fIsTooLarge)
+    transferred.fOutcome.fReason = "the file is larger than " + ExactSizeText(options.fMostBytes) + "; --max-size allows more";
+  else
+    BlameTheDisk(transferred.fOutcome, part);
+  MarkForResuming(part, state);
   transferred.fOutcome.fReason += PartText(part);
   return transferred;
 }
@@ -264,6 +292,15 @@ void AddTransferOptions(CLI::App& command, TTransferOptions& options) {
   command.add_option("--netrc", options.fNetrc, "The file with users and passwords ($NETRC, else ~/.netrc)");
 }
 
+void AddSizeOption(CLI::App& command, std::string const& name, std::uint64_t& bytes, std::string const& description) {
+  CLI::Validator const check([&bytes](std::string& text) { return WhyNoSize(text, bytes); }, "SIZE, such as 500K, 2M or 1G");
+  command
+      .add_option_function<std::string>(
+          name, [](std::string const&) {}, description)
+      ->check(check)
+      ->type_name("");
+}
+
 std::string TransferHelp() {
   return "Passwords come from the URL (which other users may see in the list of processes), from netrc, or from a prompt.\n"
          "The key of an SFTP server is not checked: who stands in its place gets the password.\n"
@@ -291,12 +328,15 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
   transferred.fBytes = static_cast<std::uint64_t>(before.st_size);
 
   FindPassword(target.fRemote, options.fNetrc);
-  transferred.fUrl = ShownUrlOf(PlaceOf(target));
-  transferred.fOutcome = Transfer([&] { return Send(file, target); }, transferred, target.fRemote.fPassword, true, options);
-  ExplainNoConnection(transferred.fOutcome, target.fRemote);
+  TRemote const place = PlaceOf(target);
+  transferred.fUrl = ShownUrlOf(place);
+  TSharedTransferState const state;
+  int const cleanUpSeconds = CleanUpSecondsOf(options);
+  transferred.fOutcome =
+      Transfer([&] { return Upload(place, file, cleanUpSeconds, *state); }, *state, transferred.fBytes, options);
+  ExplainNoConnection(transferred.fOutcome, place);
   if (transferred.fOutcome.fExit != kExitComplete) {
-    bool const wasReached = transferred.fOutcome.fExit == kExitNothing || transferred.fOutcome.fExit == kExitStalled;
-    if (wasReached) transferred.fOutcome.fReason += "; the server may have a part of it";
+    ExplainUpload(transferred.fOutcome, *state);
     return transferred;
   }
   bool const isAsBefore = IsAsBefore(file, before);
@@ -312,10 +352,13 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
   transferred.fUrl = ShownUrlOf(remote);
   TLockFile const lock(part + ".lock");
   if (!lock.WhyNotHad().empty()) return Failed(transferred, kExitNotWritten, lock.WhyNotHad());
-  if (!MakeRoomFor(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
-  transferred.fOutcome = Transfer([&] { return Fetch(UrlOf(remote), part); }, transferred, remote.fPassword, false, options);
+  bool const isThere = IsRegularFile(part);
+  if (!CanMakePart(part, isThere)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
+  TSharedTransferState const state;
+  std::uint64_t const most = options.fMostBytes;
+  transferred.fOutcome = Transfer([&] { return Download(remote, part, isThere, most, *state); }, *state, 0, options);
   ExplainNoConnection(transferred.fOutcome, remote);
-  if (transferred.fOutcome.fExit != kExitComplete) return BrokenOff(transferred);
+  if (transferred.fOutcome.fExit != kExitComplete) return BrokenOff(transferred, *state, options);
   return Completed(transferred, file, overwrites);
 }
 

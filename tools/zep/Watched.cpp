@@ -1,6 +1,8 @@
 #include "Watched.h"
 
 #include "ILogger.h"
+#include "Interrupts.h"
+#include "Secrets.h"
 #include "TChildProcess.h"
 #include "TRootObject.h"
 #include "TZEPException.h"
@@ -9,14 +11,13 @@
 #include <fcntl.h>
 #include <poll.h>
 #include <signal.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
-#include <cctype>
 #include <chrono>
 #include <filesystem>
-#include <fstream>
 #include <system_error>
 
 namespace NQRVZEP20::zep {
@@ -61,7 +62,15 @@ std::string ReportOf(std::function<TZEPStatusCode()> const& transfer) {
   return std::to_string(status.GetCode()) + " " + reason;
 }
 
-std::string ReportOfSilent(std::function<TZEPStatusCode()> const& transfer) {
+// A file that would become larger breaks off with an error of writing.
+void LimitFiles(std::uint64_t most) {
+  rlimit const limit{most, most};
+  ::signal(SIGXFSZ, SIG_IGN);
+  ::setrlimit(RLIMIT_FSIZE, &limit);
+}
+
+std::string ReportOfSilent(std::function<TZEPStatusCode()> const& transfer, std::uint64_t mostBytes) {
+  if (mostBytes > 0) LimitFiles(mostBytes);
   TDescriptor const nowhere(::open("/dev/null", O_RDWR));
   ::dup2(nowhere.Get(), STDIN_FILENO);
   ::dup2(nowhere.Get(), STDOUT_FILENO);
@@ -71,54 +80,11 @@ std::string ReportOfSilent(std::function<TZEPStatusCode()> const& transfer) {
 
 // ---- In zep ----
 
-struct stat StatusOf(std::string const& path) {
-  struct stat status {};
-  ::stat(path.c_str(), &status);  // of a file that is not there all is 0
-  return status;
-}
-
-bool IsSameFile(struct stat const& a, struct stat const& b) { return a.st_dev == b.st_dev && a.st_ino == b.st_ino; }
-
-// How far a process has read the file, whatever its name is by now.
-std::uint64_t PositionIn(struct stat const& file, pid_t process) {
-  std::error_code gone;
-  std::uint64_t position = 0;
-  std::string const directory = "/proc/" + std::to_string(process);
-  for (auto entry = fs::directory_iterator(directory + "/fd", gone); !gone && entry != fs::directory_iterator();
-       entry.increment(gone)) {
-    if (!IsSameFile(StatusOf(entry->path()), file)) continue;
-    std::ifstream info(directory + "/fdinfo/" + entry->path().filename().string());
-    std::string word;
-    std::uint64_t number = 0;
-    if (info >> word >> number && word == "pos:") position = std::max(position, number);
-  }
-  return position;
-}
-
-// What moves during a transfer: the position in a file that is sent, which was `file` at the start; the size of one that is
-// fetched.
-std::uint64_t BytesMoved(TWatch const& watch, struct stat const& file, pid_t process) {
+std::uint64_t BytesMoved(TWatch const& watch) {
+  if (watch.fMoved != nullptr) return *watch.fMoved;
   std::error_code absent;
-  if (watch.fIsUpload) return PositionIn(file, process);
   std::uintmax_t const size = fs::file_size(watch.fFile, absent);
   return absent ? 0 : size;
-}
-
-bool IsWordAt(std::string const& text, std::size_t at, std::size_t length) {
-  auto const isLetter = [&](std::size_t i) { return i < text.size() && std::isalnum(static_cast<unsigned char>(text[i])) != 0; };
-  return (at == 0 || !isLetter(at - 1)) && !isLetter(at + length);
-}
-
-// A short secret is hidden only where it stands alone: stars within other words would tell it.
-std::string Without(std::string const& secret, std::string text) {
-  constexpr std::size_t kShort = 4;
-  if (secret.empty()) return text;
-  for (std::size_t at = 0; (at = text.find(secret, at)) != text.npos;) {
-    bool const isHidden = secret.size() >= kShort || IsWordAt(text, at, secret.size());
-    if (isHidden) text.replace(at, secret.size(), "***");
-    at += isHidden ? 3 : 1;
-  }
-  return text;
 }
 
 // Where libcurl itself is missing, and not a function of it, the package that has it is named.
@@ -131,12 +97,12 @@ bool EndsWith(std::string const& text, std::string const& end) {
   return text.size() >= end.size() && text.compare(text.size() - end.size(), end.size(), end) == 0;
 }
 
-TOutcome OutcomeOf(std::string const& report, TWatch const& watch) {
+TOutcome OutcomeOf(std::string const& report) {
   std::size_t const blank = report.find(' ');
   if (blank == report.npos) return {kZEPStatusFail, kExitNothing, "the process of the transfer died"};
   TZEPStatusCode const status(static_cast<EZEPStatusCode>(std::stoi(report.substr(0, blank))));
   if (status == kZEPStatusOK) return {status, kExitComplete, ""};
-  std::string reason = Printable(Without(watch.fSecret, report.substr(blank + 1)));
+  std::string reason = Printable(MessageWithoutSecrets(report.substr(blank + 1)));
   if (EndsWith(reason, ": ")) reason += "libcurl does not tell why";
   reason += RemedyFor(reason);
   return {status, ExitStatusOf(status), reason.empty() ? status.TranslateStatusCode() : reason};
@@ -146,18 +112,24 @@ TOutcome Stalled(TWatch const& watch) {
   return {kZEPStatusTransferFailure, kExitStalled, "nothing moved for " + std::to_string(watch.fStallSeconds) + " s"};
 }
 
-// Reads the report until the child is done; false when it stood still for too long.
+TOutcome Interrupted() {
+  int const signal = PendingInterrupt();
+  EExitStatus const exit = signal == SIGHUP ? kExitHangUp : signal == SIGINT ? kExitInterrupt : kExitTermination;
+  return {kZEPStatusFail, exit, "interrupted"};
+}
+
+// Reads the report until the child is done; false when it stood still for too long, or when zep is interrupted.
 bool ReadReport(TChildProcess& child, TWatch const& watch, std::string& report) {
-  struct stat const file = StatusOf(watch.fFile);
-  std::uint64_t last = BytesMoved(watch, file, child.Id());
+  std::uint64_t last = BytesMoved(watch);
   TClock::time_point lastMoved = TClock::now();
   pollfd waiting{child.Output(), POLLIN, 0};
   while (true) {
+    if (PendingInterrupt() != 0) return false;
     if (::poll(&waiting, 1, kLookEveryMilliseconds) > 0) {
       if (!child.Read(report)) return true;
       continue;
     }
-    std::uint64_t const now = BytesMoved(watch, file, child.Id());
+    std::uint64_t const now = BytesMoved(watch);
     if (watch.fShowProgress) watch.fShowProgress(now);
     if (now != last) lastMoved = TClock::now();
     last = now;
@@ -168,11 +140,12 @@ bool ReadReport(TChildProcess& child, TWatch const& watch, std::string& report) 
 }  // namespace
 
 TOutcome RunWatched(std::function<TZEPStatusCode()> const& transfer, TWatch const& watch) {
-  TChildProcess child([&] { return ReportOfSilent(transfer); }, SIGKILL);  // a transfer does not outlive zep
+  TChildProcess child([&] { return ReportOfSilent(transfer, watch.fMostBytes); }, SIGKILL);  // a transfer does not outlive zep
   std::string report;
-  if (!ReadReport(child, watch, report)) return Stalled(watch);
+  if (!ReadReport(child, watch, report)) return PendingInterrupt() != 0 ? Interrupted() : Stalled(watch);
   child.End();
-  return OutcomeOf(report, watch);
+  if (PendingInterrupt() != 0) return Interrupted();  // which may have ended the process as well
+  return OutcomeOf(report);
 }
 
 }  // namespace NQRVZEP20::zep

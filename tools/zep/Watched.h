@@ -3,6 +3,7 @@
 #include "ExitStatus.h"
 #include "TZEPStatusCode.h"
 
+#include <atomic>
 #include <cstdint>
 #include <functional>
 #include <string>
@@ -13,13 +14,13 @@ constexpr int kUsualStallSeconds = 60;
 
 // How a transfer is watched.
 struct TWatch {
-  std::string fFile;  // the local file: a download lets it grow, an upload reads it
-  bool fIsUpload = false;
-  std::string fSecret;  // a password, which no reason is to show
+  std::string fFile;                                   // a local file that grows
+  std::atomic<std::uint64_t> const* fMoved = nullptr;  // or else a number that grows, in memory shared with that process
   // The longest standstill allowed; 0: for ever. When an upload has read its last byte, nothing moves any more: what the system
   // still holds back for a slow line goes out unseen, and must have gone by then.
   int fStallSeconds = kUsualStallSeconds;
-  std::function<void(std::uint64_t bytes)> fShowProgress;  // of that file, now and then; may be empty
+  std::uint64_t fMostBytes = 0;                            // the largest file that the transfer may write; 0: any
+  std::function<void(std::uint64_t bytes)> fShowProgress;  // of these, now and then; may be empty
 };
 
 struct TOutcome {
@@ -29,7 +30,8 @@ struct TOutcome {
 };
 
 // Does one transfer of the library in a process of its own, which can be ended when nothing moves any more: the library itself
-// waits for ever. That process reads no input and prints nothing; what it throws is the outcome.
+// waits for ever. An interrupt (Interrupts.h) ends it too. That process reads no input and prints nothing; what it throws is the
+// outcome.
 TOutcome RunWatched(std::function<TZEPStatusCode()> const& transfer, TWatch const& watch);
 
 }  // namespace NQRVZEP20::zep

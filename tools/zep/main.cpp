@@ -5,6 +5,8 @@
 #include "Failure.h"
 #include "Json.h"
 #include "Output.h"
+#include "Password.h"
+#include "Secrets.h"
 #include "Text.h"
 
 #include <CLI/CLI.hpp>
@@ -176,6 +178,13 @@ int Run(CLI::App& app, TRuns const& runs, std::vector<std::string> const& words)
   return runs.at(app.get_subcommands().front())();
 }
 
+// Before anything else, and anything that might be printed.
+void KeepSecrets(std::vector<std::string> const& words) {
+  TakePasswordOutOfTheEnvironment();
+  static TGuardedErrors const errors;  // to the end of the program
+  for (std::string const& word : words) HideIn(word);
+}
+
 // ---- Failures ----
 
 // Read from the words: CLI11 may have stopped before the option.
@@ -226,5 +235,7 @@ int RunOrFail(std::vector<std::string> const& words) {
 
 int main(int argc, char** argv) {
   NQRVZEP20::zep::SetSignals();
-  return NQRVZEP20::zep::RunOrFail({argv + 1, argv + argc});
+  std::vector<std::string> const words(argv + 1, argv + argc);
+  NQRVZEP20::zep::KeepSecrets(words);
+  return NQRVZEP20::zep::RunOrFail(words);
 }

@@ -7,6 +7,9 @@
 #include <gmock/gmock.h>
 #include <poll.h>
 #include <pty.h>
+#include <sys/prctl.h>
+#include <sys/ptrace.h>
+#include <sys/stat.h>
 
 #include <string>
 
@@ -66,6 +69,11 @@ protected:
   std::string File(std::string const& name, std::string const& text) {
     WriteFile(zep_.Path(name), text);
     return zep_.Path(name);
+  }
+
+  static std::string Private(std::string const& file) {
+    fs::permissions(file, fs::perms::owner_read | fs::perms::owner_write);
+    return file;
   }
 
   TInstallation zep_;
@@ -155,7 +163,7 @@ TEST_F(ZepRemoteTest, WithoutATerminalThePasswordMustComeFromElsewhere) {
   std::string const empty = File("empty", "");
   EXPECT_EQ(Run({"host", "--user", "u", "--password-file", empty}, password_).errors,
             "zep: there is no password in " + empty + "\n");
-  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", File("password", "zeppass1\n")}).errors,
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", Private(File("password", "zeppass1\n"))}).errors,
             "zep: host: " + kNothing + "\n");
   EXPECT_EQ(Run({"host", "--user", "u"}, {{"ZEP_BMC_PASSWORD", ""}}).errors, "zep: host: " + kNothing + "\n")
       << "an empty one is one";
@@ -179,6 +187,124 @@ TEST_F(ZepRemoteTest, ADebugLogIsForItsOwnerOnly) {
   EXPECT_EQ(ReadFile(log).find("from before"), std::string::npos);
   Run({"host", "--user", "u", "--debug-log", log + "2"}, password_);
   EXPECT_EQ(fs::status(log + "2").permissions(), static_cast<fs::perms>(0600));
+}
+
+TEST_F(ZepRemoteTest, ADebugLogIsARegularFileOfTheCaller) {
+  std::string const victim = File("victim", "untouched"), link = zep_.Path("link"), fifo = zep_.Path("fifo");
+  fs::create_symlink(victim, link);
+  fs::create_hard_link(victim, zep_.Path("second"));
+  ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
+  struct TRow {
+    std::string log, reason;
+  };
+  for (TRow const& row : {TRow{link, "it is a symbolic link"}, TRow{zep_.Path("second"), "it has a second name (a hard link)"},
+                          TRow{fifo, "it is not a regular file"}, TRow{"/dev/null", "it is not a regular file"}}) {
+    TRun const run = Run({"host", "--user", "u", "--debug-log", row.log}, password_);
+    EXPECT_EQ(run.status, 1);
+    EXPECT_EQ(run.errors, "zep: the debug log " + row.log + " cannot be written: " + row.reason + "\n");
+  }
+  EXPECT_EQ(ReadFile(victim), "untouched");
+}
+
+TEST_F(ZepRemoteTest, AFileOfAnotherUserIsNoDebugLog) {
+  NEEDS(::geteuid() == 0, "root, who may write another user's file");
+  std::string const log = File("log", "untouched");
+  ASSERT_EQ(::chown(log.c_str(), 65534, 65534), 0);
+  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", log}, password_).errors,
+            "zep: the debug log " + log + " cannot be written: it belongs to another user\n");
+  EXPECT_EQ(ReadFile(log), "untouched");
+}
+
+TEST_F(ZepRemoteTest, APasswordFileThatEveryUserMayReadIsWarnedOf) {
+  std::string const file = File("password", "zeppass1\n");
+  fs::permissions(file, static_cast<fs::perms>(0644));
+  TRun const run = Run({"host", "--user", "u", "--password-file", file});
+  EXPECT_EQ(run.errors, "zep: warning: every user may read the passwords in " + file +
+                            " (mode 0644); chmod 600 ends that\nzep: host: " + kNothing + "\n");
+  fs::permissions(file, static_cast<fs::perms>(0640));
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", file}).errors, "zep: host: " + kNothing + "\n");
+}
+
+TEST_F(ZepRemoteTest, AHostWithAPasswordIsNotAsked) {
+  TRun const run = Run({"admin:topsecret@host", "--user", "u", "--json"}, password_);
+  EXPECT_EQ(run.status, 64);
+  EXPECT_THAT(run.errors,
+              HasSubstr("zep: a host has no \"@\"; --user names the account, and its password does not belong there\n"));
+  TRun const list = Run({"--hosts", File("hosts", "admin:topsecret@host\n"), "--user", "u"}, password_);
+  EXPECT_EQ(list.status, 1);
+  EXPECT_THAT(list.output, HasSubstr("\"host\":\"admin:***@host\""));
+}
+
+// ---- The password of a process that runs ----
+
+// Calls of zep that go on for a while, as a user without privileges.
+class ZepSecretProcessTest : public ZepRemoteTest {
+protected:
+  void SetUp() override {
+    NEEDS(::geteuid() == 0, "root, who looks at another user's process");
+    zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+  }
+  void TearDown() override {
+    if (zepProcess_ <= 0) return;
+    ::kill(zepProcess_, SIGKILL);
+    ::waitpid(zepProcess_, nullptr, 0);
+  }
+
+  // zep as nobody, with a controller that does not answer; returns once the process that asks it is there.
+  void Start() {
+    zepProcess_ = ::fork();
+    if (zepProcess_ == 0) {
+      ::prctl(PR_SET_PDEATHSIG, SIGKILL);
+      ::setenv("ZEP_BMC_PASSWORD", "zeppass1", 1);
+      ::setenv("FAKE_IPMI_CODE", "wait", 1);
+      std::string const program = zep_.Path("bin/zep");
+      if (::setgroups(0, nullptr) != 0 || ::setgid(65534) != 0 || ::setuid(65534) != 0) ::_exit(126);
+      ::execl(program.c_str(), "zep", "remote", "host", "--user", "u", nullptr);
+      ::_exit(127);
+    }
+    for (int tries = 0; tries < 2000 && child_.empty(); ++tries, ::usleep(5000)) {
+      std::ifstream children("/proc/" + std::to_string(zepProcess_) + "/task/" + std::to_string(zepProcess_) + "/children");
+      children >> child_;
+    }
+    ASSERT_FALSE(child_.empty());
+  }
+
+  static unsigned OwnerOf(std::string const& process) {
+    struct stat status {};
+    return ::stat(("/proc/" + process + "/environ").c_str(), &status) == 0 ? status.st_uid : ~0u;
+  }
+
+  // errno of an attempt of the same user to trace the process; 0 when it succeeds.
+  static int TraceOf(std::string const& process) {
+    pid_t const tracer = ::fork();
+    if (tracer == 0) {
+      if (::setgroups(0, nullptr) != 0 || ::setgid(65534) != 0 || ::setuid(65534) != 0) ::_exit(126);
+      ::_exit(::ptrace(PTRACE_SEIZE, std::stoi(process), nullptr, nullptr) == 0 ? 0 : errno);
+    }
+    int status = 0;
+    ::waitpid(tracer, &status, 0);
+    return WEXITSTATUS(status);
+  }
+
+  pid_t zepProcess_ = 0;
+  std::string child_;  // the process that asks the controller
+};
+
+TEST_F(ZepSecretProcessTest, TheEnvironmentShowsNoPassword) {
+  Start();
+  for (std::string const& process : {std::to_string(zepProcess_), child_}) {
+    std::string const environment = ReadFile("/proc/" + process + "/environ");
+    EXPECT_THAT(environment, HasSubstr("FAKE_IPMI_CODE=wait"));
+    EXPECT_EQ(environment.find("zeppass1"), std::string::npos);
+  }
+}
+
+TEST_F(ZepSecretProcessTest, NoProcessOfTheSameUserLooksIntoIt) {
+  Start();
+  for (std::string const& process : {std::to_string(zepProcess_), child_}) {
+    EXPECT_EQ(OwnerOf(process), 0u) << "so it is dumped nowhere";
+    EXPECT_EQ(TraceOf(process), EPERM);
+  }
 }
 
 TEST_F(ZepRemoteTest, ADebugLogThatCannotBeWrittenIsTold) {

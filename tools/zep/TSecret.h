@@ -1,0 +1,53 @@
+#pragma once
+
+#include <cstddef>
+#include <new>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace NQRVZEP20::zep {
+
+// Overwrites the bytes, which the compiler does not leave out.
+void Wipe(void* bytes, std::size_t size);
+
+// Memory that is overwritten before it is given back.
+template <class T>
+struct TWipingAllocator {
+  using value_type = T;
+
+  TWipingAllocator() = default;
+  template <class TOther>
+  TWipingAllocator(TWipingAllocator<TOther> const&) {}
+
+  T* allocate(std::size_t count) { return static_cast<T*>(::operator new(count * sizeof(T))); }
+  void deallocate(T* memory, std::size_t count) {
+    Wipe(memory, count * sizeof(T));
+    ::operator delete(memory);
+  }
+  bool operator==(TWipingAllocator const&) const { return true; }
+  bool operator!=(TWipingAllocator const&) const { return false; }
+};
+
+using TSecretBytes = std::vector<char, TWipingAllocator<char>>;
+
+// A password. Copies are deep, and each is overwritten at its end.
+//
+// The first one that is not empty closes the process, and the children that it makes without an exec, to other processes of
+// the same user: no core dump, no ptrace, no look at the memory. Each one is hidden in what zep prints (Secrets.h).
+class TSecret {
+public:
+  TSecret() = default;
+  explicit TSecret(std::string_view text);
+
+  bool IsEmpty() const { return fBytes.empty(); }
+  std::string_view View() const { return {fBytes.data(), fBytes.size()}; }
+
+  // For the library, which takes nothing else: an ordinary text, for use in a child that ends after it only.
+  std::string ForLibrary() const { return std::string(View()); }
+
+private:
+  TSecretBytes fBytes;
+};
+
+}  // namespace NQRVZEP20::zep
