@@ -11,8 +11,8 @@ class ICIMProperty;
 class ICIMPropertyDecl;
 
 // A CIM class: its name, superclass, qualifiers, property and method declarations, and its instances. Some operations have a
-// body, so that a plug-in may leave them out; where nothing else is said, it throws kZEPStatusNotImplemented. The destination of
-// a copy needs them; see ICIMElement.h.
+// default body, so that a plug-in may leave them out; unless its comment says otherwise, that body logs an error and throws
+// kZEPStatusNotImplemented. ICIMElement.h lists what the destination of a copy needs.
 class ZEP_EXPORT ICIMClass : public ICIMNamedElement {
 public:
   ~ICIMClass() override;
@@ -20,37 +20,38 @@ public:
   virtual boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) const = 0;
 
   // True for an association: the class or one of its superclasses carries the qualifier Association. A namespace copy
-  // makes associations in a second pass, when every class that they refer to is there.
+  // creates associations in a second pass, when every class that they refer to already exists.
   virtual bool GetClassFlag(TCIMContext const& context) const = 0;
 
-  // True when this class itself carries the qualifier Abstract: it can have no instances of its own. Has a body, which
-  // answers false.
+  // True when this class itself carries the qualifier Abstract and so can have no instances of its own. Has a default body,
+  // which returns false.
   virtual bool IsAbstract(TCIMContext const& context) const;
 
   virtual bool IsRootClass(TCIMContext const& context) const = 0;                            // it has no superclass
   virtual boost::shared_ptr<ICIMClass> GetSuperClass(TCIMContext const& context) const = 0;  // empty for a root class
 
-  // Every class derived from this one, at any depth, but not the class itself. A class comes after its superclass;
+  // Visits every class derived from this one, at any depth, but not the class itself. A class comes after its superclass;
   // siblings come in the order in which they were created.
   virtual void EnumerateSubClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)> callback,
                                    TCIMContext const& context) const = 0;
 
   // ---- Declaring ----
 
-  // Between these two a plug-in knows that the class is still being described: GetPropertyDecl then answers a name that
-  // is not declared yet with an empty pointer instead of throwing. Not nested; ending what was not begun does nothing.
-  // Both have a body, which does nothing.
+  // Between these two calls the class is still being described: GetPropertyDecl then returns an empty pointer, instead of
+  // throwing, for a name that is not declared yet. The calls do not nest; EndDeclarations without BeginDeclarations does
+  // nothing. Both have a default body, which does nothing.
   virtual void BeginDeclarations(TCIMContext const& context);
   virtual void EndDeclarations(TCIMContext const& context);
 
-  // Declares a property. The default value, NULL for none, gives its type, array bound and referenced class. Throws
-  // kZEPStatusAlreadyExists when this class itself declares the name, kZEPStatusTypeMismatch for a default of tag 0, and
-  // kZEPStatusInvalidOpSequence once CreateInstance of the class or of a subclass was called.
+  // Declares a property. `defaultValue` determines its type, array bound and referenced class; a NULL value of the right
+  // type means that the property has no default. Throws kZEPStatusAlreadyExists when this class itself declares the name,
+  // kZEPStatusTypeMismatch for a default of tag 0, and kZEPStatusInvalidOpSequence once CreateInstance of the class or of a
+  // subclass has been called.
   virtual boost::shared_ptr<ICIMPropertyDecl> AddPropertyDecl(std::string const& name, TCIMValue const& defaultValue,
                                                               TCIMContext const& context) = 0;
 
-  // The declaration of a property in this class or, where it has none, the nearest in its superclasses. Throws
-  // kZEPStatusNotFound when there is none at all.
+  // The declaration of a property in this class or, when this class does not declare it, in the nearest superclass that
+  // does. Throws kZEPStatusNotFound when none of them declares it.
   virtual boost::shared_ptr<ICIMPropertyDecl const> GetPropertyDecl(std::string const& name,
                                                                     TCIMContext const& context) const = 0;
 
@@ -60,29 +61,30 @@ public:
 
   // ---- Static properties: values that belong to the class ----
 
-  // Gives a property that this class declares or inherits a value in the class itself, replacing an earlier one. Throws
-  // kZEPStatusNotFound for a name that is not declared and kZEPStatusTypeMismatch for a value of another type. Has a body.
+  // Sets the value that this class itself holds for a property that it declares or inherits; an earlier value is replaced.
+  // Throws kZEPStatusNotFound for a name that is not declared and kZEPStatusTypeMismatch for a value of another type. Has a
+  // default body.
   virtual void SetStaticProperty(std::string const& name, TCIMValue const& value, TCIMContext const& context);
 
-  // Those of this class itself, in the order in which they were first set.
+  // Visits the static properties of this class itself, in the order in which they were first set.
   virtual void EnumerateStaticProperties(boost::function<bool(boost::shared_ptr<ICIMProperty>)> callback,
                                          TCIMContext const& context) const = 0;
 
   // ---- Instances ----
 
-  // A new instance with every property at its default. It belongs to nobody but the caller until CommitInstance. Throws
+  // A new instance with every property at its default. Until CommitInstance it belongs to the caller alone. Throws
   // kZEPStatusInvalidClass for an abstract class.
   virtual boost::shared_ptr<ICIMInstance> CreateInstance(TCIMContext const& context) = 0;
 
-  // The instances of this class and then those of its subclasses, class by class in the order of EnumerateSubClasses;
-  // within a class in the order in which they were committed. ICIMInstance::GetClass tells whose each one is.
+  // Visits the instances of this class and then those of its subclasses, class by class in the order of EnumerateSubClasses,
+  // and within a class in the order in which they were committed. ICIMInstance::GetClass returns the class of an instance.
   virtual void EnumerateInstances(boost::function<bool(boost::shared_ptr<ICIMInstance>)> callback,
                                   TCIMContext const& context) const = 0;
 
   // ---- Methods ----
 
-  // Throws kZEPStatusAlreadyExists when this class itself declares the method, kZEPStatusTypeMismatch for a return type
-  // without name or an array. Has a body.
+  // Declares a method. Throws kZEPStatusAlreadyExists when this class itself declares the name, and kZEPStatusTypeMismatch
+  // for a return type that has no name or is an array. Has a default body.
   virtual boost::shared_ptr<ICIMMethodDecl> AddMethodDecl(std::string const& name, TCIMValue::TCIMType returnType,
                                                           TCIMContext const& context);
 
@@ -90,10 +92,10 @@ public:
   virtual void EnumerateMethodDecls(boost::function<bool(boost::shared_ptr<ICIMMethodDecl>)> callback,
                                     TCIMContext const& context) const = 0;
 
-  // Adds an instance that CreateInstance of this class has made to the class's instances. Throws
-  // kZEPStatusInvalidInstance for any other instance, and kZEPStatusAlreadyExists when it is already there or another
-  // instance of the class has the same keys (any number may have none, or only NULL ones). From then on its keys cannot be
-  // changed. Has a body.
+  // Adds an instance to the instances of this class; from then on its keys cannot be changed. Throws
+  // kZEPStatusInvalidInstance for an instance that CreateInstance of this class did not make, and kZEPStatusAlreadyExists
+  // when it has already been committed or another instance of the class has the same keys. Instances without keys, or with
+  // only NULL keys, are not compared. Has a default body.
   virtual void CommitInstance(boost::shared_ptr<ICIMInstance> instance, TCIMContext const& context);
 };
 

@@ -13,18 +13,19 @@ public:
 
   virtual TCIMValue::TCIMType GetReturnType(TCIMContext const& context) const = 0;  // never an array
 
-  // Adds a parameter behind the others. `referencedClassName` is empty unless the type is a reference or an array of
-  // references (kZEPStatusNotReference), `maxArraySize` is 0 unless it is an array (kZEPStatusNotArray). Throws
-  // kZEPStatusAlreadyExists when the method has a parameter of that name, kZEPStatusTypeMismatch for a type without name.
+  // Adds a parameter after the existing ones. `referencedClassName` must be empty unless the type is a reference or an array
+  // of references (otherwise throws kZEPStatusNotReference), and `maxArraySize` must be 0 unless it is an array (otherwise
+  // throws kZEPStatusNotArray). Throws kZEPStatusAlreadyExists when the method already has a parameter of that name, and
+  // kZEPStatusTypeMismatch for a type that has no name.
   virtual boost::shared_ptr<ICIMParameterDecl> AddParameterDecl(std::string const& name, TCIMValue::TCIMType type,
                                                                 unsigned int maxArraySize, std::string const& referencedClassName,
                                                                 TCIMContext const& context) = 0;
 
-  // In the order in which they were added.
+  // Visits the parameters in the order in which they were added.
   virtual void EnumerateParameterDecls(boost::function<bool(boost::shared_ptr<ICIMParameterDecl>)> callback,
                                        TCIMContext const& context) const = 0;
 
-  // The class that declares it. Has a body, which answers with an empty pointer.
+  // The class that declares the method. Has a default body, which returns an empty pointer.
   virtual boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const;
 };
 

@@ -6,7 +6,7 @@ namespace NQRVZEP20 {
 
 class ICIMMethodDecl;
 
-// The declaration of one method parameter. That it is an input or an output is told by its qualifiers In and Out.
+// The declaration of one method parameter. Its qualifiers In and Out mark it as an input or an output.
 class ZEP_EXPORT ICIMParameterDecl : public ICIMNamedElement {
 public:
   ~ICIMParameterDecl() override;
@@ -17,7 +17,7 @@ public:
   // The name of the class that a reference, or an array of references, refers to; empty for other types.
   virtual std::string GetReferencedClassName(TCIMContext const& context) const = 0;
 
-  // The method that it belongs to. Has a body, which answers with an empty pointer.
+  // The method that the parameter belongs to. Has a default body, which returns an empty pointer.
   virtual boost::weak_ptr<ICIMMethodDecl> GetMethod(TCIMContext const& context) const;
 };
 

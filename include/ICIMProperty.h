@@ -13,12 +13,12 @@ public:
 
   virtual TCIMValue GetValue(TCIMContext const& context) const = 0;
 
-  // Throws kZEPStatusTypeMismatch when the value's type, NULL or not, is not the declared one, and
-  // kZEPStatusInvalidOpSequence for a key of an instance that was committed.
+  // Throws kZEPStatusTypeMismatch when the type of the value, which may be NULL, is not the declared type, and
+  // kZEPStatusInvalidOpSequence for a key of an instance that has been committed.
   virtual void SetValue(TCIMValue const& value, TCIMContext const& context) = 0;
 
-  // Both have a body, which throws kZEPStatusNotImplemented: copying an instance needs the first, copying a static property
-  // the second.
+  // Both have a default body, which logs an error and throws kZEPStatusNotImplemented. Copying an instance needs the first,
+  // copying a static property the second.
   virtual std::string GetName(TCIMContext const& context) const;  // spelled as declared
   virtual boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(TCIMContext const& context) const;
 };

@@ -7,7 +7,7 @@ namespace NQRVZEP20 {
 class ICIMNamedElement;
 class ICIMQualifierDecl;
 
-// A qualifier as it is written on one element: a name, a value and a flavor.
+// A qualifier written on one element: a name, a value and a flavor.
 class ZEP_EXPORT ICIMQualifier {
 public:
   virtual ~ICIMQualifier();
@@ -15,9 +15,9 @@ public:
   virtual std::string GetName(TCIMContext const& context) const = 0;  // spelled as declared
   virtual TCIMValue GetValue(TCIMContext const& context) const = 0;
   virtual unsigned int GetFlavor(TCIMContext const& context) const = 0;  // a set of ICIMQualifierDecl::EFlavor
-  virtual boost::shared_ptr<ICIMQualifierDecl> GetDeclaration(TCIMContext const& context) const;  // has a body
+  virtual boost::shared_ptr<ICIMQualifierDecl> GetDeclaration(TCIMContext const& context) const;  // has a default body
 
-  // The element that it is written on. Has a body, which answers with an empty pointer.
+  // The element that carries the qualifier. Has a default body, which returns an empty pointer.
   virtual boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const;
 };
 

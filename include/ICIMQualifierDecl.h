@@ -4,10 +4,10 @@
 
 namespace NQRVZEP20 {
 
-// A qualifier declaration of a namespace: what a qualifier of this name means wherever it is written.
+// A qualifier declaration of a namespace. It fixes the type, scope, flavor and default value of the qualifiers of its name.
 class ZEP_EXPORT ICIMQualifierDecl {
 public:
-  // Where the qualifier may be written; a set of these.
+  // The kinds of element that may carry the qualifier. Values are combined with |.
   enum EScope : unsigned int {
     kScopeClass = 0x01,
     kScopeAssociation = 0x02,
@@ -19,10 +19,10 @@ public:
     kScopeAny = 0x7f
   };
 
-  // How a qualifier passes on to subclasses; a set of these. None set: restricted, with overriding disabled.
+  // How subclasses inherit the qualifier. Values are combined with |; 0 means restricted, with overriding disabled.
   enum EFlavor : unsigned int {
     kFlavorEnableOverride = 0x01,  // a subclass may give it another value
-    kFlavorToSubclass = 0x02,      // it is handed down; without this it is restricted to its own element
+    kFlavorToSubclass = 0x02,      // subclasses inherit it; without this flag it is restricted to its own element
     kFlavorTranslatable = 0x04,
     kFlavorDefault = kFlavorEnableOverride | kFlavorToSubclass
   };
@@ -34,8 +34,8 @@ public:
   virtual unsigned int GetScope(TCIMContext const& context) const = 0;   // a set of EScope
   virtual unsigned int GetFlavor(TCIMContext const& context) const = 0;  // a set of EFlavor
 
-  // The value where a qualifier is written without one. NULL when there is none; always of the declared type, and with
-  // the declared array bound.
+  // The value of a qualifier that is written without one. NULL when there is no default, but always of the declared type and
+  // with the declared array bound.
   virtual TCIMValue GetDefaultValue(TCIMContext const& context) const = 0;
 };
 

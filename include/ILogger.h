@@ -8,8 +8,8 @@
 
 namespace NQRVZEP20 {
 
-// The library's one channel for diagnostic text. TRootObject::GetCoreLogger() hands out the calling thread's logger;
-// TLogger says what each operation does.
+// The library's one channel for diagnostic text. TRootObject::GetCoreLogger() returns the calling thread's logger; TLogger
+// documents each operation.
 class ZEP_EXPORT ILogger {
 public:
   enum EZEPLogSeverity : int {
@@ -18,8 +18,8 @@ public:
     kLogStatus = 2,
     kLogDebug = 3,
     kLogVerbose = 4,
-    kLogMemoryOnly = 100,       // recorded in the in-memory list, whatever the threshold; never written
-    kLogMemoryOnlyAlways = 101  // the same; only the recorded severity differs
+    kLogMemoryOnly = 100,       // recorded in the in-memory list whatever the threshold; never written
+    kLogMemoryOnlyAlways = 101  // the same, recorded with this severity
   };
 
   // One recorded entry.

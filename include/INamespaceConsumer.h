@@ -4,8 +4,8 @@
 
 namespace NQRVZEP20 {
 
-// What a consumer plug-in's factory makes. Consumers read namespaces; host and consumer agree on a class of their own,
-// derived from this one, and the library only hands the pointer through.
+// The base of the object that a consumer plug-in's factory function creates. Consumers read namespaces. Host and consumer
+// agree on a class of their own derived from this one; the library only passes the pointer on.
 class ZEP_EXPORT INamespaceConsumer {
 public:
   virtual ~INamespaceConsumer();

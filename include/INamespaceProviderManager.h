@@ -4,21 +4,21 @@
 
 namespace NQRVZEP20 {
 
-// The registry of namespace providers, as a host sees it; TRootObject::GetNamespaceProviderManager() hands it out.
+// The registry of namespace providers, as a host sees it; TRootObject::GetNamespaceProviderManager() returns it.
 //
-// No lock: providers register while plug-ins load, before the registry is used from several threads.
+// No lock is taken: providers are expected to register while plug-ins load, before several threads use the registry.
 class ZEP_EXPORT INamespaceProviderManager {
 public:
   virtual ~INamespaceProviderManager();
 
-  // Files the provider under the name that it reports. The first provider of a name stays: a second one is dropped
-  // without a word. Names are raw bytes; case matters. An empty pointer is a failed assertion.
+  // Registers the provider under the name that its GetName returns. The first provider of a name stays; a second one is
+  // dropped silently. Kept. Names are compared byte by byte, so case matters. An empty pointer is a failed assertion.
   virtual void RegisterNamespaceProvider(boost::shared_ptr<INamespaceProvider> provider) = 0;
 
-  // Throws kZEPStatusNotFound, after an error in the log, when no provider has that name.
+  // Logs an error and throws kZEPStatusNotFound when no provider has that name.
   virtual boost::shared_ptr<INamespaceProvider> GetNamespaceProvider(std::string const& name) const = 0;
 
-  // In byte order of the names, until a call returns false.
+  // Visits the providers in byte order of their names, until a call returns false.
   virtual void EnumerateNamespaceProviders(boost::function<bool(boost::shared_ptr<INamespaceProvider>)> callback) = 0;
 };
 

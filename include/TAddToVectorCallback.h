@@ -6,7 +6,8 @@
 
 namespace NQRVZEP20 {
 
-// An enumeration callback that collects: appends each element to `elements`, which must outlive it, and goes on.
+// An enumeration callback that collects: it appends each element to `elements`, which must outlive it, and never stops the
+// enumeration.
 //
 //   std::vector<boost::shared_ptr<ICIMInstance>> instances;
 //   cls->EnumerateInstances(TAddToVectorCallback<ICIMInstance>(instances), TCIMContext());

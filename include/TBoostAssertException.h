@@ -8,14 +8,14 @@
 
 namespace NQRVZEP20 {
 
-// A failed internal assertion as an exception that carries the whole message. Only thrown while the environment variable
-// ZEP_BOOST_ASSERT is "throwboost"; otherwise a failed assertion is a TZEPException (see AssertionHandler.h).
+// Reports a failed internal assertion and carries the complete message. Thrown only while the environment variable
+// ZEP_BOOST_ASSERT is "throwboost"; AssertionHandler.h lists the other settings.
 class ZEP_EXPORT TBoostAssertException : public std::exception {
 public:
   TBoostAssertException(std::string message) : fMessage(std::move(message)) {}
   ~TBoostAssertException() override;
 
-  // "Boost assertion failure! FILE:LINE [EXPRESSION] func = FUNCTION". Valid as long as the exception.
+  // "Boost assertion failure! FILE:LINE [EXPRESSION] func = FUNCTION". Valid as long as the exception exists.
   char const* what() const noexcept override;
 
 private:

@@ -4,24 +4,26 @@
 
 namespace NQRVZEP20 {
 
-// An array: its elements, each a TCIMValue of its own, which may be NULL. That they are of one type is TCIMValue's affair.
+// The array kind of a TCIMValue's data. Each element is a TCIMValue of its own, which may be NULL. TCIMValue, not this
+// class, checks that all elements are of one type.
 class ZEP_EXPORT TCIMArrayValueImpl : public TCIMValueImpl {
 public:
   TCIMArrayValueImpl(std::vector<TCIMValue> const& elements);
   TCIMArrayValueImpl(TCIMArrayValueImpl const& other);
   ~TCIMArrayValueImpl() override;
 
-  // The elements themselves, to be edited in place even through a constant value. Edits are checked against nothing.
+  // The elements themselves, which can be edited in place even through a constant value. Edits are not checked.
   operator std::vector<TCIMValue>&() const override;
 
-  // "{ a, b }", each element printed with `radix`; an empty array is "{  }", with both blanks. Strings are not quoted.
-  // Throws what an element throws, so kZEPStatusValueIsNULL for a NULL element.
+  // "{ a, b }", each element printed with `radix`. An empty array prints "{", two blanks and "}". Strings are not quoted. An
+  // exception of an element passes through, such as kZEPStatusValueIsNULL for a NULL element.
   std::string ToString(unsigned char radix) const override;
 
-  // Equal: another array of as many elements, each pair equal in order. Two empty arrays are equal.
+  // True when `other` is an array with the same number of elements and each element equals its counterpart. Two empty arrays
+  // are equal.
   bool operator==(TCIMValue const& other) const override;
 
-  // Arrays have no order: always throws kZEPStatusNotImplemented.
+  // Arrays have no order: always throws kZEPStatusNotImplemented. Kept.
   bool operator<(TCIMValue const& other) const override;
 
 private:

@@ -18,7 +18,7 @@ public:
   TCIMChar16();  // code 0
   TCIMChar16(unsigned short code);
 
-  // A char16 built from text is NULL, whatever the text says. Kept.
+  // Makes a NULL character, whatever the text is. Kept.
   TCIMChar16(std::string const& text);
 
   TCIMChar16(TCIMChar16 const& other);
@@ -30,8 +30,9 @@ public:
   // The code in decimal: 65 gives "65". Throws kZEPStatusInvalidDateTime for a NULL character.
   std::string ToString() const;
 
-  // True for any two characters, whatever their codes: all are equal, and each is less than the other. Do not sort or
-  // deduplicate by these. Throws kZEPStatusInvalidDateTime when either is NULL. Kept.
+  // Both return true for any two characters, whatever their codes: all characters are equal, and each is less than every
+  // other. Do not sort or deduplicate with these operators. Both throw kZEPStatusInvalidDateTime when either character is
+  // NULL. Kept.
   bool operator==(TCIMChar16 const& other) const;
   bool operator<(TCIMChar16 const& other) const;
 

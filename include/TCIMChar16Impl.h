@@ -8,22 +8,22 @@
 
 namespace NQRVZEP20 {
 
-// What a TCIMChar16 holds: a 16-bit character code, or NULL.
+// The body of a TCIMChar16: a 16-bit character code, or NULL.
 class ZEP_EXPORT TCIMChar16Impl {
 public:
   TCIMChar16Impl() noexcept = default;  // code 0
   TCIMChar16Impl(unsigned short code) noexcept : fCode(code) {}
 
-  // NULL, whatever the text says. Kept.
+  // Makes a NULL character, whatever the text is. Kept.
   TCIMChar16Impl(std::string const& text) noexcept;
 
   unsigned short GetValue() const noexcept { return fCode; }
 
-  // The code in decimal. Throws kZEPStatusInvalidDateTime when this is NULL.
+  // The code in decimal. Throws kZEPStatusInvalidDateTime for a NULL character.
   std::string ToString() const;
 
-  // True whatever the codes are, for both. Throws kZEPStatusInvalidDateTime (a datetime's code, kept) when either
-  // character is NULL. An empty pointer is a failed assertion.
+  // All four return true, whatever the codes are. They throw kZEPStatusInvalidDateTime when either character is NULL. Kept.
+  // An empty pointer is a failed assertion.
   bool operator==(TCIMChar16Impl const& other) const;
   bool operator<(TCIMChar16Impl const& other) const;
   bool operator==(boost::shared_ptr<TCIMChar16Impl> const& other) const;

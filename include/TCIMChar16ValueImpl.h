@@ -5,8 +5,8 @@
 
 namespace NQRVZEP20 {
 
-// A 16-bit character. A value that holds one is not NULL, but the character may be: it then can be neither printed nor
-// compared (kZEPStatusInvalidDateTime).
+// The char16 kind of a TCIMValue's data. The value is then not NULL, but the character may be; printing or comparing a NULL
+// character throws kZEPStatusInvalidDateTime.
 class ZEP_EXPORT TCIMChar16ValueImpl : public TCIMValueImpl {
 public:
   TCIMChar16ValueImpl(TCIMChar16 const& character);
@@ -18,7 +18,7 @@ public:
   // The code in decimal, whatever the radix.
   std::string ToString(unsigned char radix) const override;
 
-  // As TCIMChar16 compares: any two characters are equal, and each is less than the other.
+  // Compare as TCIMChar16 does: any two characters are equal, and each is less than the other.
   bool operator==(TCIMValue const& other) const override;
   bool operator<(TCIMValue const& other) const override;
 

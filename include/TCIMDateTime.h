@@ -27,7 +27,7 @@ public:
   TCIMDateTime& operator=(TCIMDateTime const& other);
   ~TCIMDateTime();
 
-  // ---- Setting. Each throws kZEPStatusInvalidDateTime for what it cannot take, and then keeps the old value. ----
+  // ---- Setting. A Set that refuses its arguments throws kZEPStatusInvalidDateTime and keeps the old value. ----
 
   // Reads the 25-character CIM text: "yyyymmddHHMMSS.mmmmmm+uuu" (or "-uuu"; minutes east of UTC) for a timestamp,
   // "ddddddddHHMMSS.mmmmmm:000" for an interval.
@@ -37,15 +37,16 @@ public:
   // `microSeconds` 0 to 999999.
   void Set(unsigned int days, unsigned short hours, unsigned short minutes, unsigned short seconds, unsigned int microSeconds);
 
-  // Makes this a timestamp; `utcOffset` is in minutes east of UTC. Valid is what mktime can convert: since it normalises,
-  // month 13 or second 75 pass. 1 January 1970 is valid at any time of day. `microSeconds` is not examined.
+  // Makes this a timestamp; `utcOffset` is in minutes east of UTC. The fields are valid when mktime can convert them; since
+  // mktime normalises, month 13 and second 75 pass. 1 January 1970 is valid at any time of day. `microSeconds` is not
+  // checked. Kept.
   void Set(unsigned short year, unsigned short month, unsigned int day, unsigned short hour, unsigned short minute,
            unsigned short second, unsigned int microSeconds, short utcOffset);
 
-  void SetPrecision(bool precision);  // stored and handed back; changes neither text nor comparison
+  void SetPrecision(bool precision);  // stored for GetPrecision; affects neither text nor comparison
   void Clear();                       // makes this NULL
 
-  // ---- Fields. Those of a NULL datetime mean nothing. ----
+  // ---- Fields. Those of a NULL datetime are meaningless. ----
 
   bool IsNull() const;
   bool IsInterval() const;
@@ -58,30 +59,31 @@ public:
   unsigned int GetMicroSeconds() const;
   short GetUTCOffset() const;  // minutes east of UTC
   bool GetPrecision() const;
-  boost::shared_ptr<TCIMDateTimeImpl> GetBody() const;  // still owned by this datetime, which changes with it
+  boost::shared_ptr<TCIMDateTimeImpl> GetBody() const;  // shared, not a copy: changing it changes this datetime
 
   // ---- Text ----
 
-  std::string ToString() const;  // the 25-character CIM text; a field wider than its place prints whole
+  std::string ToString() const;  // the 25-character CIM text; longer when a field has too many digits
 
-  // For people: "03/15/2007 14:30:00" (no microseconds, no offset), or "2 days 1 hour 5 milliseconds " for an interval,
-  // with its trailing blank. A zero interval gives an empty text.
+  // A readable text: "03/15/2007 14:30:00" (no microseconds, no offset), or "2 days 1 hour 5 milliseconds " for an interval,
+  // with the trailing blank. A zero interval gives an empty text.
   std::string ToUIString() const;
 
   // ---- Comparison. Timestamps compare by the instant they denote, then by microseconds; intervals by their length.
-  //      Throws kZEPStatusInvalidDateTime for a NULL, or for one timestamp and one interval. ----
+  //      Throws kZEPStatusInvalidDateTime when either is NULL, or when one is a timestamp and the other an interval. ----
 
   bool operator==(TCIMDateTime const& other) const;
   bool operator<(TCIMDateTime const& other) const;
 
-  // ---- Arithmetic. Both operands stay as they are. Throws kZEPStatusInvalidDateTime for a NULL, and where the C library
-  //      cannot convert. Results before 1970 or beyond the platform's limit follow localtime. ----
+  // ---- Arithmetic. The operands do not change. Throws kZEPStatusInvalidDateTime when either is NULL or when the C library
+  //      cannot convert the time. Results before 1970 or beyond the platform's limit follow localtime. ----
 
-  // Interval + interval; timestamp + interval in either order, with the timestamp's UTC offset. Two timestamps throw.
+  // Interval + interval gives an interval. Timestamp + interval, in either order, gives a timestamp with the UTC offset of
+  // the timestamp. Adding two timestamps throws kZEPStatusInvalidDateTime.
   TCIMDateTime operator+(TCIMDateTime const& other) const;
 
-  // Two timestamps, or two intervals: the absolute difference, as an interval. Timestamp - interval, and also
-  // interval - timestamp: a timestamp with the timestamp's UTC offset.
+  // The difference of two timestamps or of two intervals is an interval without a sign. Timestamp - interval, and also
+  // interval - timestamp, gives a timestamp with the UTC offset of the timestamp. Kept.
   TCIMDateTime operator-(TCIMDateTime const& other) const;
 
   static TCIMDateTime GetDifference(TCIMDateTime& a, TCIMDateTime& b);  // always throws kZEPStatusNotImplemented

@@ -8,13 +8,13 @@
 
 namespace NQRVZEP20 {
 
-// The fields of a TCIMDateTime and the rules for them. Callers use TCIMDateTime, which says what each operation does and
-// throws; this class is for those who reach into one through GetBody.
+// The body of a TCIMDateTime: its fields and the rules for them. Use TCIMDateTime, which documents every operation; this
+// class is public because TCIMDateTime::GetBody returns it.
 //
-// A plain value, NULL when new. Not synchronised.
+// A plain value; a new one is NULL. Not synchronised.
 class ZEP_EXPORT TCIMDateTimeImpl {
 public:
-  // Whether Set would take these fields.
+  // Whether Set would accept these fields.
   static bool IsValid(unsigned int days, unsigned short hours, unsigned short minutes, unsigned short seconds,
                       unsigned int microSeconds);
   static bool IsValid(unsigned short year, unsigned short month, unsigned int day, unsigned short hour, unsigned short minute,
@@ -48,7 +48,7 @@ public:
   TCIMDateTimeImpl operator-(TCIMDateTimeImpl const& other) const;
 
 private:
-  // Results of arithmetic, from a total in microseconds.
+  // Turn a total in microseconds into the result of an operation.
   static TCIMDateTimeImpl IntervalOf(std::int64_t total);
   static TCIMDateTimeImpl TimestampOf(std::int64_t total, short utcOffset);
 

@@ -14,7 +14,7 @@ public:
 
   operator TCIMDateTime() const override;
 
-  // The CIM text, whatever the radix. Throws kZEPStatusInvalidDateTime for a NULL datetime, as the comparisons do.
+  // The CIM text, whatever the radix. This and the comparisons throw kZEPStatusInvalidDateTime for a NULL datetime.
   std::string ToString(unsigned char radix) const override;
 
   bool operator==(TCIMValue const& other) const override;

@@ -4,8 +4,8 @@
 
 namespace NQRVZEP20 {
 
-// A boolean, an integer or a real. It is read only as exactly the type it is stored as: any other conversion throws
-// kZEPStatusTypeMismatch.
+// The numeric kind of a TCIMValue's data: a boolean, an integer or a real. It can be converted only to exactly the type that
+// is stored; any other conversion throws kZEPStatusTypeMismatch.
 class ZEP_EXPORT TCIMNumericValueImpl : public TCIMValueImpl {
 public:
   TCIMNumericValueImpl(bool value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeBoolean), fBoolean(value) {}
@@ -34,21 +34,21 @@ public:
   operator float() const override;
   operator double() const override;
 
-  // `radix` is 10, 16 or 8; anything else throws kZEPStatusNotSupported, for a boolean too. Unsigned integers print in each,
-  // in base 16 with capitals and zeros up to the width of the type, in base 8 without padding. Signed integers and reals
-  // print in decimal only and otherwise throw kZEPStatusNotSupported. A boolean is "true" or "false". A real has six
-  // significant digits, fixed or with an exponent, whichever is shorter, and a point whatever the process's locale is.
+  // `radix` is 10, 16 or 8; any other value throws kZEPStatusNotSupported, for a boolean too. Unsigned integers print in all
+  // three: base 16 uses capitals and pads with zeros to the width of the type, base 8 does not pad. Signed integers and
+  // reals print in base 10 only and throw kZEPStatusNotSupported for 8 and 16. A boolean prints "true" or "false". A real
+  // prints six significant digits, in the form that printf gives for %g, with a point in any locale.
   std::string ToString(unsigned char radix) const override;
 
-  // No comparison across types: uint8 5 and uint16 5 are neither equal nor ordered. A NaN equals nothing, not even itself,
-  // and nothing is less or greater.
+  // Values of different types are neither equal nor ordered: uint8 5 and uint16 5 compare false both ways. Kept. A NaN is
+  // not equal to anything, not even to itself, and < is false when either side is a NaN.
   bool operator==(TCIMValue const& other) const override;
   bool operator<(TCIMValue const& other) const override;
 
 private:
   friend class TCIMArrayValueImpl;
 
-  // ToString without the string: writes the text at `place`, where there is room for 32 bytes, and returns its end.
+  // Like ToString, but writes the text to `place`, which has room for 32 bytes, and returns the end of the text.
   char* PutText(char* place, unsigned char radix) const;
 
 protected:

@@ -18,16 +18,16 @@ class ICIMElement;
 class ICIMNamespace;
 class TCIMReferenceImpl;
 
-// A CIM object path in parsed form: the namespace it lives in, the class, and the key bindings.
+// A CIM object path in parsed form: a namespace, a class and the key bindings.
 //
-// The namespace is held weakly: a reference never keeps one alive. Copies are deep and share only the class and the
-// resolved element. Keys can be added only once a class is set, and the class can be changed only while there are no
-// keys; what comes in the wrong order throws kZEPStatusInvalidOpSequence. Exceptions of the namespace pass through unless
-// said otherwise. A reference that was moved from can be assigned to or destroyed; any other use is a failed assertion.
-// Not synchronised.
+// The namespace is held by a weak pointer: a reference never keeps it alive. Copies are deep and share only the class and
+// the resolved element. Keys can be added only once a class is set, and the class can be changed only while there are no
+// keys; any other order throws kZEPStatusInvalidOpSequence. Exceptions thrown by the namespace pass through unless a comment
+// says otherwise. A moved-from reference can only be assigned to or destroyed; any other use is a failed assertion. Not
+// synchronised.
 class ZEP_EXPORT TCIMReference {
 public:
-  // An empty reference on that namespace. `context` is handed to the namespace whenever a class is looked up by name.
+  // An empty reference in the namespace `ns`. `context` is passed to the namespace whenever a class is looked up by name.
   TCIMReference(boost::shared_ptr<ICIMNamespace> ns, TCIMContext context);
 
   // The same, followed by SetPath(path).
@@ -41,52 +41,53 @@ public:
 
   // ---- Paths ----
 
-  // `X_Disk.Id="5",Name="a\"b"`: the class name and the keys in byte order of their names. The namespace is not printed. A
-  // backslash stands before each quote and backslash of a value, but the path of a reference value is printed raw.
+  // The class name and the keys in byte order of their names, such as `X_Disk.Id="5",Name="a\"b"`. The namespace is not
+  // printed. Each quote and backslash in a value is escaped with a backslash, but the path of a reference value is printed
+  // raw. Kept.
   std::string GetPath() const;
 
-  // Reads a path into a reference that has a live namespace, no class and no keys. Keys are read only behind a namespace
-  // prefix (`ns:X_Disk.Id="5"`), which is dropped; without one the whole text is a class name. Malformed paths, unknown
-  // classes and keys, and references nested more than 100 deep are logged as errors and throw kZEPStatusInvalidReference;
-  // what was read before stays set. A key that comes twice keeps its first value.
+  // Reads a path into a reference that has a live namespace, no class and no keys. Keys are read only after a namespace
+  // prefix (`ns:X_Disk.Id="5"`), which is dropped; without a prefix the whole text is taken as a class name. Kept. Malformed
+  // paths, unknown classes and keys, and references nested more than 100 deep are logged as errors and throw
+  // kZEPStatusInvalidReference; the parts read before the error stay set. A key that occurs twice keeps its first value.
   void SetPath(std::string const& path);
 
   // ---- Parts ----
 
-  boost::shared_ptr<ICIMNamespace> GetNamespace() const;  // empty once the namespace is gone
+  boost::shared_ptr<ICIMNamespace> GetNamespace() const;  // empty after the namespace has been destroyed
   void SetNamespace(boost::shared_ptr<ICIMNamespace> ns);
 
-  // A label of the caller's: nothing reads it, and neither parsing nor printing touches it.
+  // A label for the caller's own use: the library stores it, and neither parsing nor printing uses it.
   std::string GetNameSpaceName() const;
   void SetNameSpaceName(std::string name);
 
   boost::shared_ptr<ICIMClass> GetClass() const;  // empty until set
   void SetClass(boost::shared_ptr<ICIMClass> cls);
-  std::string GetClassName() const;  // a reference without class is a failed assertion
+  std::string GetClassName() const;  // without a class: a failed assertion
 
-  // Sets the class that the namespace knows by that name. Throws boost::bad_weak_ptr when the namespace is gone, and
-  // kZEPStatusNotFound, as the namespace does, when there is no such class.
+  // Looks the class up in the namespace and sets it. Throws boost::bad_weak_ptr when the namespace has been destroyed; the
+  // namespace throws kZEPStatusNotFound when it has no such class.
   void SetClassName(std::string const& name);
 
-  // Binds a key. Throws kZEPStatusTypeMismatch, after an error in the log, when the value's type is not the declared one,
-  // and kZEPStatusNotFound when the class has no such property. The first binding of a name wins: another is dropped
-  // without a word.
+  // Binds a key. Logs an error and throws kZEPStatusTypeMismatch when the type of the value is not the declared type; throws
+  // kZEPStatusNotFound when the class has no such property. The first binding of a name wins: a later one is dropped
+  // silently. Kept.
   void AddKeyValue(std::string const& name, TCIMValue const& value);
 
   // Calls back with each (name, value) in byte order of the names until a call returns false.
   void EnumerateKeyBindings(boost::function<bool(std::pair<std::string, TCIMValue>)> callback) const;
 
   void SetContext(TCIMContext context);
-  void Clear();  // empties namespace, class, keys and the resolved element
+  void Clear();  // removes namespace, class, keys and the resolved element
 
   // ---- Resolving ----
 
-  // The class when `classOnly` or when there are no keys; otherwise the instance that the class's namespace knows under
-  // this path, which is asked for once and then remembered. Throws kZEPStatusNotFound when there is no such instance.
+  // The class when `classOnly` is true or there are no keys; otherwise the instance that this path names in the class's
+  // namespace. The instance is looked up once and then remembered. Throws kZEPStatusNotFound when there is none.
   boost::shared_ptr<ICIMElement> GetCIMElement(bool classOnly) const;
 
-  // ---- Comparison. Equal: the same class object and equal keys. Order: by keys within one class object, else by the two
-  //      class objects, in an arbitrary but stable order. ----
+  // ---- Comparison. Two references are equal when they have the same class object and equal keys. References with the same
+  //      class object are ordered by their keys, others by their class objects, in an arbitrary but stable order. ----
 
   bool operator==(TCIMReference const& other) const;
   bool operator<(TCIMReference const& other) const;
@@ -98,7 +99,7 @@ private:
     BOOST_ASSERT(fBody != nullptr);
     return *fBody;
   }
-  void BindBody() noexcept;  // tells the body whose it is now
+  void BindBody() noexcept;  // makes this reference the owner of its body
 
   std::unique_ptr<TCIMReferenceImpl> fBody;  // null only in a reference that was moved from
 };

@@ -14,7 +14,7 @@ namespace NQRVZEP20 {
 
 class ICIMPropertyDecl;
 
-// The body of a TCIMReference: its fields and its rules. TCIMReference says what each operation does; it forwards them all.
+// The body of a TCIMReference: its fields and rules. TCIMReference forwards every operation to this class and documents it.
 class ZEP_EXPORT TCIMReferenceImpl {
 public:
   TCIMReferenceImpl(TCIMReference& owner, boost::shared_ptr<ICIMNamespace> ns, TCIMContext context);
@@ -25,9 +25,9 @@ public:
 
   void SetOwner(TCIMReference& owner) noexcept { fOwner = owner; }
 
-  // Reads the path into `target` from `pos` on, which comes back behind what was read. A `pos` other than 0 stands on the
-  // opening quote of a reference that is a key's value in an enclosing path: reading then ends on the closing quote, or at
-  // the end of the path, where a missing quote is not noticed.
+  // Reads `path` into `target`, starting at `pos`, and advances `pos` past the text that was read. A `pos` other than 0 is
+  // the opening quote of a reference that is the value of a key in an enclosing path; reading then stops at the closing
+  // quote or at the end of the path. A missing closing quote is not detected.
   static void ParsePath(TCIMReferenceImpl& target, std::string const& path, std::size_t& pos);
   static void ParsePath(TCIMReference& target, std::string const& path, std::size_t& pos) {
     ParsePath(*target.GetBody(), path, pos);
@@ -69,14 +69,14 @@ private:
   boost::shared_ptr<ICIMPropertyDecl const> ReadDeclaration(std::string const& path, std::string const& name) const;
   TCIMValue ReadReference(boost::shared_ptr<ICIMNamespace> const& ns, std::string const& path, std::size_t& pos) const;
 
-  std::reference_wrapper<TCIMReference> fOwner;  // handed to the namespace when the instance is looked up
+  std::reference_wrapper<TCIMReference> fOwner;  // passed to the namespace when the instance is looked up
   boost::weak_ptr<ICIMNamespace> fNamespace;
-  TCIMContext fContext;                     // handed to the namespace when a class is looked up
-  boost::shared_ptr<ICIMClass> fClass;      // empty until set; not changed while there are keys
+  TCIMContext fContext;                     // passed to the namespace when a class is looked up
+  boost::shared_ptr<ICIMClass> fClass;      // empty until set; fixed while there are keys
   TKeyBindings fKeys;                       // by name, in byte order
   boost::shared_ptr<ICIMElement> fElement;  // the instance, once found; never looked up again
-  std::string fNamespaceName;               // the caller's label; has nothing to do with fNamespace
-  int fDepth = 0;                           // how many paths that are being read this one stands in
+  std::string fNamespaceName;               // the caller's label; unrelated to fNamespace
+  int fDepth = 0;                           // the number of paths being read that enclose this one
 };
 
 }  // namespace NQRVZEP20

@@ -5,7 +5,7 @@
 
 namespace NQRVZEP20 {
 
-// An object path.
+// The reference kind of a TCIMValue's data: an object path.
 class ZEP_EXPORT TCIMReferenceValueImpl : public TCIMValueImpl {
 public:
   TCIMReferenceValueImpl(TCIMReference const& reference);
@@ -17,7 +17,7 @@ public:
   // The path, whatever the radix.
   std::string ToString(unsigned char radix) const override;
 
-  // As TCIMReference compares.
+  // Compare as TCIMReference does.
   bool operator==(TCIMValue const& other) const override;
   bool operator<(TCIMValue const& other) const override;
 

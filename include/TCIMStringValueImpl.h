@@ -4,7 +4,7 @@
 
 namespace NQRVZEP20 {
 
-// A string: bytes, of which no encoding is assumed.
+// The string kind of a TCIMValue's data: bytes in no particular encoding.
 class ZEP_EXPORT TCIMStringValueImpl : public TCIMValueImpl {
 public:
   TCIMStringValueImpl(std::string const& text);
@@ -17,7 +17,7 @@ public:
   // The text itself, neither quoted nor escaped, whatever the radix.
   std::string ToString(unsigned char radix) const override;
 
-  // Case-sensitive, in the order of the unsigned bytes.
+  // Compare unsigned bytes, so case matters. False for a value that is not a string.
   bool operator==(TCIMValue const& other) const override;
   bool operator<(TCIMValue const& other) const override;
 

@@ -20,12 +20,13 @@ class TCIMNumericValueImpl;
 class TCIMReference;
 class TCIMValueImpl;
 
-// One typed CIM value: every property value, method argument, key value and array element that crosses the library.
+// One typed CIM value. Every property value, method argument, key value and array element that crosses the library's
+// interface is a TCIMValue.
 //
-// A value is a type tag and, unless it is NULL, the data. A NULL value has a tag all the same: a property can be a NULL
-// uint32, or a NULL array of string with at most 8 elements. Copies are deep and share nothing but the referenced class.
-// Conversions out of a value are strict: the requested type must be exactly the stored one. Not synchronised: concurrent
-// reads are safe, a write needs exclusive access.
+// A value is a type tag and, unless it is NULL, the data. A NULL value has a tag too: a property can be a NULL uint32, or a
+// NULL array of string with at most 8 elements. Copies are deep and share nothing except the referenced class. Conversions
+// out of a value are strict: the requested type must be exactly the stored type. Not synchronised: concurrent reads are
+// safe, a write needs exclusive access.
 class ZEP_EXPORT TCIMValue {
 public:
   // The type tag: a CIM intrinsic type, and whether it is an array of that type.
@@ -53,13 +54,13 @@ public:
 
     TCIMType(ECIMType type) noexcept : fType(type) {}
 
-    // The type of that CIM name ("uint8", "string", ...), in any mix of upper and lower case. There is no array syntax. An
-    // unknown name raises no error: the tag is then kCIMTypeInvalid.
+    // The type with that CIM name ("uint8", "string", ...), in any mix of upper and lower case. There is no array syntax. An
+    // unknown name is not an error: it gives the tag kCIMTypeInvalid.
     TCIMType(std::string name);
 
     operator ECIMType() const noexcept { return fType; }
 
-    // The CIM name of the base type: an array of sint32 prints "sint32", with no array mark. Throws
+    // The CIM name of the base type: an array of sint32 prints "sint32", without an array mark. Kept. Throws
     // kZEPStatusTypeMismatch for tag 0 and for a base type above 15.
     std::string ToString() const;
 
@@ -67,12 +68,12 @@ public:
     ECIMType fType;
   };
 
-  // ---- Construction. Each form below starts from the default state and calls the Set of the same arguments. ----
+  // ---- Construction. Each constructor starts from the default state and calls the Set with the same arguments. ----
 
-  // NULL, tag 0, no referenced class, maximum array size 0.
+  // The default state: NULL, tag 0, no referenced class, maximum array size 0.
   TCIMValue() noexcept;
 
-  // A NULL value of that type. An `arraySize` other than 0 makes it an array with that declared bound.
+  // A NULL value of that type. An `arraySize` other than 0 makes it an array type with that declared bound.
   TCIMValue(TCIMType type, unsigned int arraySize);
 
   TCIMValue(bool value);
@@ -93,12 +94,13 @@ public:
   TCIMValue(TCIMReference& value);
   TCIMValue(TCIMType type, unsigned int maxArraySize, std::vector<TCIMValue> const& elements);
 
-  // A scalar read from its text, which is not modified; `ns` serves references only. Numbers are read as a standard stream
-  // in the classic locale reads them, in decimal: leading white space is skipped, reading stops at the first character that
-  // cannot go on with the number, and what cannot be read is 0. uint8 and sint8 are read as 32-bit numbers and cut to
-  // 8 bits without a range check. A boolean is the word "true" or "false". A char16 is NULL whatever the text says (see
-  // TCIMChar16). Throws kZEPStatusTypeMismatch for tag 0, tags above 15 and arrays, kZEPStatusInvalidDateTime for a
-  // malformed datetime, and what TCIMReference::SetPath throws for a malformed reference.
+  // A scalar read from text. `text` is not modified; `ns` is used for references only. Numbers are read in decimal, as a
+  // standard stream in the classic locale reads them: leading white space is skipped, reading stops at the first character
+  // that cannot continue the number, and a text without a number gives 0. uint8 and sint8 are read as 32-bit numbers and cut
+  // to 8 bits without a range check. A boolean is the word "true" or "false"; anything else gives false. A char16 is a NULL
+  // character, whatever the text is (see TCIMChar16). Kept. Throws kZEPStatusTypeMismatch for tag 0, tags above 15 and
+  // arrays, kZEPStatusInvalidDateTime for a malformed datetime, and what TCIMReference::SetPath throws for a malformed
+  // reference.
   TCIMValue(TCIMType type, std::string& text, boost::shared_ptr<ICIMNamespace> ns);
 
   TCIMValue(TCIMValue const& other);
@@ -107,18 +109,19 @@ public:
 
   // ---- Assignment ----
 
-  // Assignment first asks whether the two are equal (so it throws what == throws) and then changes nothing at all: a NULL
-  // reference that compares equal keeps its own referenced class, an equal array its own maximum size. Otherwise the tag
-  // and the data are taken over, the maximum array size only for an array, the referenced class only for a reference.
-  // A value may be assigned from itself or from one of its own elements.
+  // Assignment first compares the two values with ==, and so throws what == throws. If they are equal it changes nothing at
+  // all: the value keeps its own referenced class and maximum array size. Kept. Otherwise it takes over the tag and the
+  // data, the maximum array size only of an array, and the referenced class only of a reference. A value may be assigned
+  // from itself or from one of its own elements.
   TCIMValue& operator=(TCIMValue const& other);
   TCIMValue& operator=(TCIMValue&& other);
   void Set(TCIMValue const& other);
 
-  // Makes this NULL with exactly that type. Only for an array type is the maximum array size set.
+  // Makes this NULL with exactly that type. `arraySize` becomes the maximum array size if the type is an array type, and is
+  // ignored otherwise.
   void SetNullValue(TCIMType::ECIMType type, unsigned int arraySize);
 
-  // These replace the data and the tag; the referenced class and the maximum array size stay as they are.
+  // These replace the data and the tag; the referenced class and the maximum array size do not change.
   void Set(bool value);
   void Set(unsigned char value);
   void Set(signed char value);
@@ -135,16 +138,17 @@ public:
   void Set(std::string const& value);
   void Set(TCIMDateTime const& value);
 
-  // Also sets the referenced class, to the reference's class.
+  // Also sets the referenced class to the reference's class.
   void Set(TCIMReference& value);
 
   // Makes this an array of `type` holding a copy of the elements. `maxArraySize` is the declared bound, 0 for none; it is
   // never compared with the number of elements. An element of another type is logged as an error and throws
-  // kZEPStatusInvalidProperty (kZEPStatusTypeMismatch, unlogged, when its tag has no name). That check comes after the
-  // assignment: the value keeps the new array.
+  // kZEPStatusInvalidProperty; one whose tag has no name throws kZEPStatusTypeMismatch and is not logged. The elements are
+  // checked after the assignment, so the value keeps the new array even then. Kept.
   void Set(TCIMType type, unsigned int maxArraySize, std::vector<TCIMValue> const& elements);
 
-  // Only a NULL value takes a referenced class; otherwise throws kZEPStatusInvalidOpSequence and changes nothing.
+  // Sets the referenced class of a NULL value. If the value is not NULL, throws kZEPStatusInvalidOpSequence and changes
+  // nothing.
   void SetReferencedClass(boost::shared_ptr<ICIMClass> referencedClass);
 
   // ---- Queries ----
@@ -152,12 +156,12 @@ public:
   bool IsNull() const noexcept { return !fData; }
   TCIMType GetType() const noexcept { return fType; }
   bool IsArray() const noexcept { return (fType & TCIMType::kCIMTypeArrayFlag) != 0; }
-  bool IsReference() const noexcept { return fType == TCIMType::kCIMTypeReference; }    // an array of references is not one
+  bool IsReference() const noexcept { return fType == TCIMType::kCIMTypeReference; }    // false for an array of references
   unsigned int GetMaxArraySize() const noexcept { return fMaxArraySize; }               // 0: unbounded, or not an array
   boost::shared_ptr<ICIMClass> GetReferencedClass() const { return fReferencedClass; }  // may be empty
 
-  // ---- Conversions. Each throws kZEPStatusValueIsNULL for a NULL value, else kZEPStatusTypeMismatch unless the tag is
-  //      exactly that of the type asked for. A char16 is read through its text. ----
+  // ---- Conversions. Each throws kZEPStatusValueIsNULL for a NULL value, and otherwise kZEPStatusTypeMismatch unless the tag
+  //      is exactly that of the requested type. There is no conversion to TCIMChar16: use ToString, which gives the code. ----
 
   operator bool() const;
   operator unsigned char() const;
@@ -174,17 +178,18 @@ public:
   operator TCIMDateTime() const;
   operator TCIMReference() const;
 
-  // The elements themselves, to be read or edited in place; edits are checked against nothing. The reference lives until
-  // the value is next changed or destroyed.
+  // The elements themselves, which can be edited in place; edits are not checked. The returned reference is valid until the
+  // value is next changed or destroyed.
   operator std::vector<TCIMValue>&() const;
 
-  // The value as text. `radix` is 8, 10 or 16 and concerns unsigned integers: base 16 is in capitals and filled with zeros
-  // to the width of the type. Throws kZEPStatusValueIsNULL for a NULL value or element, and kZEPStatusNotSupported for
-  // another radix, or for 8 and 16 with a signed or real number. Strings are neither quoted nor escaped; an array is
-  // "{ a, b }"; strings, datetimes, char16 and references ignore the radix.
+  // The value as text. `radix` is 8, 10 or 16; 8 and 16 are for unsigned integers, and base 16 prints capitals padded with
+  // zeros to the width of the type. Strings, datetimes, char16 and references ignore the radix. Strings are neither quoted
+  // nor escaped; an array prints "{ a, b }". Throws kZEPStatusValueIsNULL for a NULL value or element. For a boolean or a
+  // number, throws kZEPStatusNotSupported when the radix is none of the three, or is 8 or 16 and the number is signed or
+  // real.
   std::string ToString(unsigned char radix = 10) const;
 
-  // ---- Comparisons. NULL sorts first, then the order is that of the tags, then that of the data. <= and > ask == first.
+  // ---- Comparisons. NULL sorts first; other values are ordered by tag and then by data. <= and > evaluate == first.
   //      Comparing two arrays of one type with < throws kZEPStatusNotImplemented. ----
 
   bool operator==(TCIMValue const& other) const;
@@ -197,14 +202,14 @@ public:
 private:
   friend class TCIMValueImpl;
 
-  // Owns the data of one value. A number, the smallest and most frequent kind, lies in the value itself and costs no
+  // Owns the data of one value. A number, the smallest and most frequent kind, is stored inside the value and needs no
   // allocation; every other kind is on the heap.
   class TData {
   public:
     TData() noexcept : fImpl(nullptr) {}
     explicit TData(TCIMNumericValueImpl const& number) noexcept;
     explicit TData(std::unique_ptr<TCIMValueImpl> data) noexcept;
-    static TData CopyOf(TCIMType type, TData const& other);  // `type`: that of the value which holds `other`
+    static TData CopyOf(TCIMType type, TData const& other);  // `type`: the type of the value that holds `other`
     TData(TData&& other) noexcept;
     TData& operator=(TData&& other) noexcept;
     ~TData();
@@ -217,7 +222,7 @@ private:
     bool IsInPlace() const noexcept;
     void Take(TData& other) noexcept;
 
-    TCIMValueImpl* fImpl;  // null, the number in fPlace, or on the heap and owned
+    TCIMValueImpl* fImpl;  // null; or points to the number in fPlace; or owns a heap object
     alignas(void*) unsigned char fPlace[24];
   };
 
@@ -228,15 +233,15 @@ private:
   void TakeFrom(TCIMValue& other) noexcept;
 
   TCIMType fType;
-  TData fData;  // none means the value is NULL; never shared
+  TData fData;  // empty means the value is NULL; never shared
   boost::shared_ptr<ICIMClass> fReferencedClass;
   unsigned int fMaxArraySize;
 };
 
-// Writes the type's name, as TCIMType::ToString gives and throws it.
+// Writes the name that TCIMType::ToString returns; throws what it throws.
 ZEP_EXPORT std::ostream& operator<<(std::ostream& stream, TCIMValue::TCIMType const& type);
 
-// What a caller carries along with an object model operation, by name. Empty unless an operation says otherwise.
+// Named values that a caller passes along with an object model operation. Empty unless an operation says otherwise.
 using TCIMContext = std::map<std::string, TCIMValue>;
 
 }  // namespace NQRVZEP20

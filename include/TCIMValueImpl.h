@@ -8,11 +8,11 @@
 
 namespace NQRVZEP20 {
 
-// The data of a TCIMValue that is not NULL: one kind of implementation per kind of CIM type.
+// The data of a TCIMValue that is not NULL. Each kind of CIM type has a class derived from this one.
 //
-// The base refuses every conversion with kZEPStatusTypeMismatch; a kind overrides those it can do. An implementation is
-// never changed once it is made (but see TCIMArrayValueImpl), so any number of threads may read it. Callers hold a
-// TCIMValue and seldom meet this class.
+// Every conversion of this base class throws kZEPStatusTypeMismatch; a kind overrides those that it supports. An object is
+// not changed after construction (except the elements of a TCIMArrayValueImpl), so any number of threads may read it.
+// Callers use TCIMValue and seldom need this class.
 class ZEP_EXPORT TCIMValueImpl {
 public:
   virtual ~TCIMValueImpl() = default;
@@ -34,11 +34,11 @@ public:
   virtual operator TCIMReference() const;
   virtual operator std::vector<TCIMValue>&() const;
 
-  // The data as text; each kind says what `radix` means to it.
+  // The data as text; each kind documents its use of `radix`.
   virtual std::string ToString(unsigned char radix) const = 0;
 
-  // Comparison with a value that holds data; false for a value of another type. A NULL value of the same type throws
-  // kZEPStatusValueIsNULL.
+  // Compare with a value that is not NULL. False for a value of another type; throws kZEPStatusValueIsNULL for a NULL value
+  // of the same type.
   virtual bool operator==(TCIMValue const& other) const = 0;
   virtual bool operator<(TCIMValue const& other) const = 0;
 
@@ -47,7 +47,8 @@ protected:
   TCIMValueImpl(TCIMValueImpl const&) = default;
   TCIMValueImpl& operator=(TCIMValueImpl const&) = delete;
 
-  // The data of another value, whose tag the caller has found to be that of TKind. Throws kZEPStatusValueIsNULL for NULL.
+  // The data of `value`, whose tag the caller has checked to be that of TKind. Throws kZEPStatusValueIsNULL for a NULL
+  // value.
   template <class TKind>
   static TKind const& DataOf(TCIMValue const& value) {
     return static_cast<TKind const&>(DataOf(value));

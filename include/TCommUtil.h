@@ -12,20 +12,21 @@ class ZEP_EXPORT TCommUtil {
 public:
   TCommUtil() {}
 
-  // Appends the pieces of `path` between separators to `parts`. With `keepSeparator` each piece ends in the separator's
-  // first character. Only one character is stepped over at each separator, however long it is. "/var/log" gives
-  // "", "var", "log", or "/", "var/", "log"; a trailing separator gives no empty last piece, an empty path nothing.
+  // Splits `path` at each `separator` and appends the pieces to `parts`. With `keepSeparator` each piece keeps the first
+  // character of the separator that ends it. Only one character is skipped at each separator, even if the separator is
+  // longer. "/var/log" gives "", "var", "log", or with `keepSeparator` "/", "var/", "log". A trailing separator adds no
+  // empty last piece; an empty path adds nothing.
   static void SplitPath(std::string const& path, std::vector<std::string>& parts, std::string const& separator,
                         bool keepSeparator);
 
-  // Creates every missing directory along the path. Throws what TOSSpecific::CreateDir throws, and leaves the directories
-  // made until then; a plain file in the way is kZEPStatusDirectoryAlreadyExists. A directory that another thread or process
-  // makes at the same time is no failure.
+  // Creates every missing directory along the path. Throws what TOSSpecific::CreateDir throws, such as
+  // kZEPStatusDirectoryAlreadyExists when a component is a plain file; the directories created before the failure remain. A
+  // directory that another thread or process creates at the same time is not a failure.
   static void MkDirHier(std::string const& path);
 
-  // The first line of a text without the blanks around it, and without what follows its first carriage return (a blank
-  // before that one stays). Tabs are no blanks. Empty when what is left holds anything but ASCII letters, digits,
-  // punctuation and white space.
+  // The first line of `text`, cut at its first carriage return, without leading and trailing blanks; blanks directly before
+  // the carriage return stay. Kept. Tabs do not count as blanks. The result is empty when the remaining text contains
+  // anything but ASCII letters, digits, punctuation and white space.
   static std::string RemoveSpaces(std::string text);
 };
 

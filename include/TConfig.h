@@ -15,33 +15,33 @@ namespace NQRVZEP20 {
 //   flag            a line without "=" is a key that maps to itself
 //
 // Nothing is stripped: blanks and carriage returns belong to the key or the value. A line whose key or value is empty is
-// passed over, and of two lines with one key the first counts. No operation throws for a missing or malformed file. A
-// missing or empty file is logged as an error, and so is one that cannot be read to its end, of which no line is used. One
-// that cannot be opened, and lines that are no settings, are passed over silently. Kept.
+// skipped, and of two lines with the same key the first counts. No operation throws for a missing or malformed file. A
+// missing or empty file is logged as an error, and so is a file that cannot be read to its end, of which no line is used. A
+// file that cannot be opened, and lines that are not settings, are skipped silently. Kept.
 //
-// The library uses one TConfig, read on its first use; a file that is made or changed later is not seen. The first
-// GetInstance is expected from one thread, during start-up; from then on any thread may read.
+// The library uses one TConfig, which reads the file on first use; a file created or changed later has no effect. The first
+// call of GetInstance must come from one thread, during start-up; afterwards any thread may read.
 class ZEP_EXPORT TConfig {
 public:
-  // The one of the process; never null, never replaced, never destroyed by the library.
+  // The TConfig of the process. Never null; the library never replaces or destroys it.
   static TConfig* GetInstance();
 
   // Reads the file.
   TConfig();
 
-  // Destroys the one of the process first, when there is one, and leaves GetInstance with its old address: nobody may use
-  // that from then on. So make no other TConfig where GetInstance is used, and never delete what it returned.
+  // Destroying any TConfig first destroys the one of the process, if there is one, and GetInstance then returns a dangling
+  // pointer. So create no other TConfig in a program that uses GetInstance, and never delete the returned pointer. Kept.
   ~TConfig();
   TConfig(TConfig const&) = delete;
   TConfig& operator=(TConfig const&) = delete;
 
-  // Adds the settings of the file to those that are there, which stay. An empty file counts as missing.
+  // Reads the file and adds its settings; settings that already exist are not changed. An empty file counts as missing.
   void parseConfigFile();
 
-  // The value of a key, to the letter; empty when there is none.
+  // The value of a key, verbatim. A missing key is logged as an error and gives an empty text.
   std::string getValue(std::string const& key);
 
-  // Every key, in ascending byte order.
+  // Every key, in ascending byte order. When there are no settings at all, logs an error and returns an empty vector.
   std::vector<std::string> listKeys();
 
   static TConfig* cfgInstance;  // null until its first use

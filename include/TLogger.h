@@ -9,26 +9,27 @@
 
 namespace NQRVZEP20 {
 
-// The logger. Each thread has its own, with its own log file; the threshold, the log directory and the in-memory list of
-// the important entries are shared by all.
+// The logger. Each thread has its own logger and log file; all threads share the threshold, the log directory and the
+// in-memory list of important entries.
 //
-// A thread's logger has no file until the thread calls Initialize or SetLogFilename; it is destroyed, and its file closed,
-// when the thread ends. Every written line is flushed at once. The list is guarded by a lock; threshold and directory are
-// not, and are meant to be set during start-up. Every operation blocks for the file system.
+// A thread's logger has no file until the thread calls Initialize or SetLogFilename; when the thread ends, the logger is
+// destroyed and its file closed. Every written line is flushed at once. A lock guards the list while an entry is added or
+// the list cleared. The threshold and the directory are not guarded; set them during start-up. Operations that write block
+// for the file system.
 class ZEP_EXPORT TLogger : public ILogger {
 public:
-  // The calling thread's logger, made on its first call. Never null; owned by the thread. What still calls this after the
-  // thread's logger was destroyed (from the destructor of a static object, say) gets a new one, which has no file. Throws
-  // boost::thread_resource_error when the system has no place for it.
+  // The calling thread's logger, created on the thread's first call. Never null; owned by the thread. A call after the
+  // thread's logger was destroyed, for example from the destructor of a static object, creates a new one, which has no file.
+  // Throws boost::thread_resource_error when the system has no resources for it.
   static TLogger* GetInstance();
 
   // ---- Shared by all threads ----
 
-  // Entries with a severity above the threshold are dropped. Initially kLogStatus. Any value is taken.
+  // Entries with a severity above the threshold are dropped. Initially kLogStatus. Any value is accepted.
   static void SetLogThreshold(EZEPLogSeverity threshold);
 
-  // Where Initialize puts log files: a directory with its trailing slash. Initially
-  // "/var/log/QRV_Support/ZepDebugLog/". Any text is taken.
+  // The directory in which Initialize creates log files, with its trailing slash. Initially
+  // "/var/log/QRV_Support/ZepDebugLog/". Any text is accepted.
   static void SetLogFileDir(std::string directory);
   static std::string GetLogFileDir();
 
@@ -44,42 +45,43 @@ public:
   // Writes the closing banner and closes the file, if one is open.
   ~TLogger() override;
 
-  // Makes the log directory with its parents (permission bits 0777 less the umask: under the usual one others may list the
-  // names of the log files, under a umask of 0 they may also rename and replace them) and opens "<directory><name>.log"
-  // through SetLogFilename. Only the first successful call of an instance does anything; every return is kZEPStatusOK. What
-  // TCommUtil::MkDirHier and SetLogFilename throw passes through, and Initialize can then be called again.
+  // Creates the log directory with its parents (permission bits 0777 minus the umask: with the usual umask other users can
+  // list the names of the log files, with a umask of 0 they can also rename and replace them) and opens
+  // "<directory><name>.log" through SetLogFilename. After the first success, further calls on the same logger do nothing.
+  // Always returns kZEPStatusOK. Exceptions of TCommUtil::MkDirHier and SetLogFilename pass through, and Initialize can then
+  // be called again.
   TZEPStatusCode Initialize(std::string name);
 
-  // Opens the file and writes the opening banner. A file that is made here has the permission bits 0600, whatever the
-  // umask: entries at debug severity may hold passwords and the contents of files. An existing file keeps its bits and its
-  // owner, and is truncated, unless the environment variable QRV_YBNQI_GUI_T is set (to anything), which appends. Throws
-  // kZEPStatusAccessDenied for EACCES and kZEPStatusFileSystemError for any other failure; the name stays set then, and nothing
-  // is written until a later call succeeds. A stream opened by an earlier call stays open, unused.
+  // Opens the file and writes the opening banner. A new file gets the permission bits 0600, whatever the umask, because
+  // entries at debug severity may contain passwords and the contents of files. An existing file keeps its bits and its
+  // owner; it is truncated, or appended to when the environment variable QRV_YBNQI_GUI_T is set (to anything). Throws
+  // kZEPStatusAccessDenied for EACCES and kZEPStatusFileSystemError for any other failure; the name is set even then, and
+  // nothing is written until a later call succeeds. A stream opened by an earlier call stays open, unused. Kept.
   void SetLogFilename(std::string path) override;
 
   // ---- Writing ----
 
-  // Drops an entry above the threshold before anything else is done; kLogMemoryOnly and kLogMemoryOnlyAlways are never
-  // dropped. Records severities up to kLogStatus (negative ones too) and the two memory-only ones in the list; writes the
-  // others to this thread's file, if it has one:
+  // Drops an entry above the threshold before doing anything else; kLogMemoryOnly and kLogMemoryOnlyAlways are never
+  // dropped. Adds entries up to kLogStatus (negative ones too) and memory-only entries to the list. Writes every entry that
+  // is not memory-only to this thread's file, if there is one, in this form:
   //   FDR_[Status] 3/3/2024  9:5:7 message
-  // A zero byte in the message ends the written line there, without a newline; the list has the whole message.
-  // Throws kZEPStatusFail when a file is open and the severity is none of kLogError to kLogVerbose. Failing writes go
-  // unnoticed.
+  // A zero byte in the message ends the written line there, without a newline; the list holds the complete message. Kept.
+  // Throws kZEPStatusFail when a file is open and the severity is not kLogError to kLogVerbose or memory-only. A failing
+  // write is not reported.
   void OutputLogEntry(EZEPLogSeverity severity, std::string const& message) override;
 
-  // Hands the same line to the system log, whatever the threshold; nothing is recorded. Throws kZEPStatusFail when the
-  // severity is none of kLogError to kLogVerbose.
+  // Writes the same line to the system log, whatever the threshold; nothing is added to the list. Throws kZEPStatusFail when
+  // the severity is not kLogError to kLogVerbose.
   void SysLogEntry(EZEPLogSeverity severity, std::string const& message) override;
 
   // ---- The list ----
 
-  std::list<TLogEntry>& GetLog() override;  // the list itself, unlocked: do not read it while other threads log
+  std::list<TLogEntry>& GetLog() override;  // the shared list, unlocked: do not read it while other threads log
   void ClearLog() override;
   EZEPLogSeverity GetLogThreshold() override;
 
 private:
-  std::string fLogFilename;  // set before the open, so it stays set when the open fails
+  std::string fLogFilename;  // set before the file is opened, so it stays set when opening fails
   std::FILE* fLogFile;
   bool fInitialized;
 

@@ -6,7 +6,8 @@
 
 namespace NQRVZEP20 {
 
-// The one registry of the process. Made when the library is loaded; it and its providers live until the process ends.
+// The provider registry of the process. It is created when the library is loaded; the registry and its providers live until
+// the process ends.
 class ZEP_EXPORT TNamespaceProviderManager : public INamespaceProviderManager {
 public:
   static boost::shared_ptr<TNamespaceProviderManager> GetInstance();
@@ -17,7 +18,7 @@ public:
   boost::shared_ptr<INamespaceProvider> GetNamespaceProvider(std::string const& name) const override;
   void EnumerateNamespaceProviders(boost::function<bool(boost::shared_ptr<INamespaceProvider>)> callback) override;
 
-  static boost::shared_ptr<TNamespaceProviderManager> fgInstance;  // set while the library is loaded
+  static boost::shared_ptr<TNamespaceProviderManager> fgInstance;  // set when the library is loaded
 
 private:
   std::map<std::string, boost::shared_ptr<INamespaceProvider>> fProviders;  // by name, in byte order

@@ -8,15 +8,15 @@ namespace NQRVZEP20 {
 class IIPMILan;
 class ILogger;
 
-// Where a host starts: the way to the process-wide objects.
+// A host's access to the process-wide objects. Static operations only.
 class ZEP_EXPORT TRootObject {
 public:
   static boost::shared_ptr<INamespaceProviderManager> GetNamespaceProviderManager();
 
-  // The link to the management controller; null before IIPMILan::Initialize.
+  // The link to the management controller; null before IIPMILan::Initialize. The library owns it.
   static IIPMILan* GetipmiLanIns();
 
-  // The calling thread's logger. The library's own; never null.
+  // The calling thread's logger. The library owns it; never null.
   static ILogger* GetCoreLogger();
 };
 

@@ -6,14 +6,14 @@
 
 namespace NQRVZEP20 {
 
-// The library's exception: one status code. Thrown by value, caught by reference; `catch (TZEPException const& e)`.
+// The library's exception type. It carries one status code. Catch it by reference: `catch (TZEPException const& e)`.
 class ZEP_EXPORT TZEPException : public std::exception {
 public:
   TZEPException(TZEPStatusCode code) noexcept : fStatusCode(code) {}
   TZEPException(EZEPStatusCode code) noexcept : fStatusCode(code) {}
   ~TZEPException() override;
 
-  // The name of the held code, such as "kZEPStatusTypeMismatch". Valid to the end of the process.
+  // The name of the held code, such as "kZEPStatusTypeMismatch". Valid until the end of the process.
   char const* what() const noexcept override;
 
   TZEPStatusCode const& GetStatusCode() const noexcept { return fStatusCode; }

@@ -6,7 +6,7 @@
 
 namespace NQRVZEP20 {
 
-// The status codes of the whole library. Every failure that is reported by exception carries one of them.
+// The status codes of the library. Every failure that is reported by a TZEPException carries one of them.
 enum EZEPStatusCode : int {
   kZEPStatusOK = 0,
   kZEPStatusNotImplemented,
@@ -51,10 +51,10 @@ enum EZEPStatusCode : int {
   kZEPStatusLuzFilecopyFailure,
   kZEPStatusTransferFailure,
   kZEPStatusCimomConnectFailure,
-  fdrStatusEnd  // not a status: the value of the last entry, which names itself
+  fdrStatusEnd  // not a status: the number of statuses above; its text is its own name
 };
 
-// One status code as a value. It is made implicitly from an enumerator and compares with one. Any thread may read it.
+// One status code as a value. It converts implicitly from an enumerator and compares with one. Any thread may read it.
 class ZEP_EXPORT TZEPStatusCode {
 public:
   TZEPStatusCode(EZEPStatusCode code = kZEPStatusOK) noexcept : fCode(code) {}
@@ -62,8 +62,8 @@ public:
 
   EZEPStatusCode GetCode() const noexcept { return fCode; }
 
-  // The code's text: its own constant name, such as "kZEPStatusNotFound". The reference stays valid to the end of the
-  // process. There is no range check: the code must lie in kZEPStatusOK to fdrStatusEnd.
+  // The code's text, which is the name of its constant, such as "kZEPStatusNotFound". The reference is valid until the end
+  // of the process. The range is not checked: the code must be between kZEPStatusOK and fdrStatusEnd.
   std::string const& TranslateStatusCode() const;
 
   friend bool operator==(TZEPStatusCode const& a, TZEPStatusCode const& b) noexcept { return a.fCode == b.fCode; }

@@ -1,4 +1,4 @@
 #pragma once
 
-// Marks what libzepcore.so exports. Everything else in the library is hidden.
+// Marks a symbol that libzepcore.so exports. Every other symbol of the library is hidden.
 #define ZEP_EXPORT __attribute__((visibility("default")))

@@ -1,6 +1,6 @@
 #pragma once
 
-// Every public header of the library.
+// Includes every public header of the library.
 
 #include "AssertionHandler.h"
 #include "AutoProxyDiscovery.h"
