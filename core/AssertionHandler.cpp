@@ -12,7 +12,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-// A null pointer puts the stream into its error state: the rest of the message is dropped.
+// A null argument puts the stream into its error state, which drops the rest of the message.
 std::string MessageOf(char const* expr, char const* function, char const* file, long line) {
   std::ostringstream message;
   message.imbue(std::locale::classic());
@@ -24,13 +24,13 @@ void HandleFailedAssertion(char const* expr, char const* function, char const* f
   char const* const setting = std::getenv("ZEP_BOOST_ASSERT");
   std::string const mode = setting ? setting : "throwzep";
   std::string const message = MessageOf(expr, function, file, line);
-  TRootObject::GetCoreLogger();  // makes the thread's logger, although nothing is written to it. Kept.
+  TRootObject::GetCoreLogger();  // creates the thread's logger, although nothing is logged. Kept.
 
   if (mode == "throwzep") throw TZEPException(kZEPStatusFail);
   if (mode == "throwboost") throw TBoostAssertException(message);
   if (mode == "trap") {
     std::cerr << std::endl << message << std::endl << std::endl << "Forcing segmentation fault." << std::endl;
-    return;  // no fault is raised: the caller goes on. Kept.
+    return;  // no fault is raised, and the caller continues. Kept.
   }
   if (mode == "exit") {
     std::cerr << std::endl << message << std::endl;

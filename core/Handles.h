@@ -11,8 +11,8 @@
 
 namespace NQRVZEP20 {
 
-// Owners of what the operating system hands out. Each releases it when it goes out of scope and can be moved, not copied;
-// release() lets go without releasing.
+// Owners of operating system resources. Each closes its resource when it goes out of scope, and can be moved but not copied.
+// release() gives up ownership without closing.
 
 struct TFileCloser {
   void operator()(std::FILE* file) const noexcept { std::fclose(file); }
@@ -29,13 +29,13 @@ struct TLibraryCloser {
 };
 using TSharedLibrary = std::unique_ptr<void, TLibraryCloser>;
 
-// The function of that name in a library, or null.
+// The function `name` of a library; null when the library lacks it.
 template <class TFunction>
 TFunction* FunctionOf(void* library, char const* name) {
   return reinterpret_cast<TFunction*>(::dlsym(library, name));
 }
 
-// Why the call of the linker before failed; empty when it did not.
+// Why the preceding call of the dynamic linker failed; empty when it succeeded.
 inline std::string LinkerReason() {
   char const* const reason = ::dlerror();
   return reason ? reason : "";

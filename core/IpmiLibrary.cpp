@@ -6,7 +6,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-// Each is null when the library lacks it: the others serve all the same.
+// A pointer is null when the library lacks that function; the others can still be used.
 struct TIpmiFunctions {
   decltype(&::OpenConnection) open;
   decltype(&::SendIpmiCommand) send;
@@ -27,7 +27,7 @@ TIpmiFunctions const& Functions() {
   return functions;
 }
 
-// Calls one of the functions. What that throws passes through.
+// Calls one of the functions. An exception that the function throws passes through.
 template <class TFunction, class... TArguments>
 int Call(TFunction TIpmiFunctions::*member, TArguments... arguments) {
   TFunction function = nullptr;

@@ -9,14 +9,15 @@
 namespace NQRVZEP20 {
 
 // The platform library libipmiClient.so, for the rooms that talk to a management controller. It is loaded by its plain name
-// when first needed and then stays loaded; while it cannot be had, each call tries again. What it throws passes through.
+// on first use and then stays loaded; as long as loading fails, each call tries again. Exceptions thrown by the library pass
+// through.
 //
-// Each function returns what the library returns, 0 for success; kZEPStatusFileSystemError when it could not be loaded,
-// kZEPStatusNotFound when it lacks the function.
+// Each function returns the library's result, 0 for success; kZEPStatusFileSystemError when the library cannot be loaded,
+// and kZEPStatusNotFound when it lacks the function.
 
 constexpr char const* kIpmiPort = "623";
 
-// Opens a session over the LAN, on that port.
+// Opens a session over the LAN, on port kIpmiPort.
 int OpenIpmiConnection(std::string const& host, std::string const& user, std::string const& password);
 
 struct TIpmiCommand {
@@ -24,7 +25,7 @@ struct TIpmiCommand {
   std::vector<unsigned char> request;
 };
 
-// What the library wrote; zeros where it wrote nothing. The last byte is never written.
+// The response as the library wrote it. Bytes that it did not write are 0; the last byte is always 0.
 using TIpmiResponse = std::array<unsigned char, kIpmiClientResponseSize + 1>;
 
 int SendIpmiCommand(TIpmiCommand const& command, TIpmiResponse& response);

@@ -8,13 +8,13 @@
 
 namespace NQRVZEP20 {
 
-// The log door: how every room logs. It takes the pieces of a message, asks the threshold first, and only then builds the
-// text, so that a filtered call costs no allocation. Without a logger it is silent.
+// The functions through which every room logs. Each takes the pieces of a message, compares the severity with the threshold,
+// and only then builds the text, so that a filtered call allocates nothing. Without a logger they do nothing.
 //
 //   LogDebug("TConfig::getValue(): key ", key, " found, value is ", value);
 
-// Whether an entry of that severity would get past the threshold of the calling thread's logger; the memory-only ones always
-// do.
+// Whether the calling thread's logger would accept an entry of that severity: the severity is not above the threshold or is
+// one of the memory-only ones.
 bool IsLogged(ILogger::EZEPLogSeverity severity);
 
 void WriteLogEntry(ILogger::EZEPLogSeverity severity, std::string const& message);

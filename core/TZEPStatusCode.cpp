@@ -5,7 +5,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-// The text of each code: its own constant name.
+// The text of each code, which is the name of its constant.
 std::array<std::string, fdrStatusEnd + 1> const kZEPErrorMessages = {
     "kZEPStatusOK",
     "kZEPStatusNotImplemented",

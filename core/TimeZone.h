@@ -5,12 +5,12 @@
 
 namespace NQRVZEP20 {
 
-// Watches the environment variable TZ, for those who must call tzset when it changes: localtime_r does not, and mktime does
-// whenever it is called. One for each thread; without a destructor, so that it serves the thread to its very end.
+// Watches the environment variable TZ for code that must call tzset when it changes: localtime_r does not call tzset, while
+// mktime does on every call. Use one object per thread. It has no destructor, so it can be used until the very end of the
+// thread.
 class TTimeZone {
 public:
-  // Whether TZ is not as it was when this was asked before. True the first time, and always for a text that is too long to
-  // be kept.
+  // Whether TZ has changed since the last call. True on the first call, and on every call while TZ is too long to be stored.
   bool HasChanged() {
     char const* const zone = std::getenv("TZ");
     if (IsKept(zone)) return false;
@@ -31,8 +31,8 @@ private:
   }
 
   bool fIsKept = false;
-  bool fIsSet = false;  // whether there is a TZ
-  char fText[64] = {};  // of TZ
+  bool fIsSet = false;  // whether TZ was set at the last call
+  char fText[64] = {};  // the value of TZ at the last call
 };
 
 }  // namespace NQRVZEP20
