@@ -96,11 +96,11 @@ public:
 
   // A scalar read from text. `text` is not modified; `ns` is used for references only. Numbers are read in decimal, as a
   // standard stream in the classic locale reads them: leading white space is skipped, reading stops at the first character
-  // that cannot continue the number, and a text without a number gives 0. uint8 and sint8 are read as 32-bit numbers and cut
-  // to 8 bits without a range check. A boolean is the word "true" or "false"; anything else gives false. A char16 is a NULL
-  // character, whatever the text is (see TCIMChar16). Kept. Throws kZEPStatusTypeMismatch for tag 0, tags above 15 and
-  // arrays, kZEPStatusInvalidDateTime for a malformed datetime, and what TCIMReference::SetPath throws for a malformed
-  // reference.
+  // that cannot continue the number, a text without a number and a number that does not fit its type give 0, and a negative
+  // number read as an unsigned type wraps around. uint8 and sint8 are read as 32-bit numbers and cut to 8 bits without a
+  // range check. A boolean is the word "true" or "false"; anything else gives false. A char16 is a NULL character, whatever
+  // the text is (see TCIMChar16). Kept. Throws kZEPStatusTypeMismatch for tag 0, tags above 15 and arrays,
+  // kZEPStatusInvalidDateTime for a malformed datetime, and what TCIMReference::SetPath throws for a malformed reference.
   TCIMValue(TCIMType type, std::string& text, boost::shared_ptr<ICIMNamespace> ns);
 
   TCIMValue(TCIMValue const& other);

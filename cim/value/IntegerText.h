@@ -6,16 +6,16 @@
 
 namespace NQRVZEP20 {
 
-// Integers as text. Each function writes a number at `place` and returns the end of the text. It may write some bytes
-// beyond that end, but none behind kRoomForInteger, and for numbers of at most 32 bits none behind kRoomForShort.
+// Integers as text. Each function writes a number to `place` and returns the end of the text. It may write a few bytes
+// beyond that end, but at most kRoomForInteger bytes in total, and for numbers of at most 32 bits at most kRoomForShort.
 //
-// Digits are written eight at a time, each to where it stays: text that is copied right after it was put together from
-// smaller pieces takes twice as long.
+// Digits are written eight at a time, directly to their final place: composing the text from smaller pieces and then copying
+// it takes twice as long.
 
 constexpr std::size_t kRoomForInteger = 32;
 constexpr std::size_t kRoomForShort = 15;
 
-// Eight digits, the first one in the lowest byte, as text has them in memory.
+// The characters of eight digits, the first one in the lowest byte: the order that text has in memory.
 using TEightDigits = std::uint64_t;
 
 constexpr TEightDigits kEightZeros = 0x3030303030303030;
@@ -25,12 +25,13 @@ inline char* PutEight(char* place, TEightDigits digits) {
   return place + sizeof digits;
 }
 
-// The values 0 to 9 of the eight decimal digits of a number below 100000000. Each step splits every number in two.
+// The values (0 to 9) of the eight decimal digits of a number below 100000000. Each step splits every group of digits into
+// two halves.
 inline TEightDigits DecimalValues(std::uint32_t number) {
   std::uint64_t const fours = number / 10000 | std::uint64_t(number % 10000) << 32;
-  std::uint64_t const hundreds = (fours * 10486 >> 20) & 0x0000007F0000007F;  // a hundredth of each
+  std::uint64_t const hundreds = (fours * 10486 >> 20) & 0x0000007F0000007F;  // each group divided by 100
   std::uint64_t const twos = hundreds | (fours - hundreds * 100) << 16;
-  std::uint64_t const tens = (twos * 103 >> 10) & 0x000F000F000F000F;  // a tenth of each
+  std::uint64_t const tens = (twos * 103 >> 10) & 0x000F000F000F000F;  // each group divided by 10
   return tens | (twos - tens * 10) << 8;
 }
 
@@ -64,11 +65,11 @@ inline TEightDigits HexDigits(std::uint32_t number) {
   values = (values | values << 16) & 0x0000FFFF0000FFFF;
   values = (values | values << 8) & 0x00FF00FF00FF00FF;
   values = (values | values << 4) & 0x0F0F0F0F0F0F0F0F;
-  std::uint64_t const letters = (values + 0x0606060606060606) >> 4 & 0x0101010101010101;  // 1 for 10 and above
+  std::uint64_t const letters = (values + 0x0606060606060606) >> 4 & 0x0101010101010101;  // 1 where the digit is a letter
   return __builtin_bswap64(kEightZeros + values + letters * ('A' - '0' - 10));
 }
 
-// In capitals, with zeros to the width of the type. Writes nothing beyond the end.
+// In capitals, padded with zeros to the width of the type. Writes nothing beyond the returned end.
 template <class TUnsigned>
 char* PutHex(char* place, TUnsigned number) {
   if constexpr (sizeof number > 4) place = PutEight(place, HexDigits(static_cast<std::uint32_t>(number >> 32)));

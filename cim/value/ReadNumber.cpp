@@ -18,7 +18,7 @@ std::string_view WithoutLeadingBlanks(std::string_view text) {
   return text.substr(blanks);
 }
 
-// Takes a leading sign off the text and tells whether it was a minus.
+// Removes a leading sign from `text` and returns whether it was a minus.
 bool TakeSign(std::string_view& text) {
   if (text.empty() || (text[0] != '+' && text[0] != '-')) return false;
   bool const negative = text[0] == '-';
@@ -38,8 +38,8 @@ TInteger ReadInteger(std::string_view text) {
   return static_cast<TInteger>(negative ? 0 - magnitude : magnitude);
 }
 
-// The characters that can make up a real, one after the other: digits, a point, an exponent with its sign. What is taken
-// need not be a number: "." and "1e" are taken whole.
+// The leading characters of `text` that can belong to a real: digits, a point, an exponent with its sign. They need not form
+// a number: the result may be "." or "1e".
 std::string_view TakeReal(std::string_view text) {
   bool hasDigits = false, hasPoint = false, hasExponent = false;
   std::size_t i = 0;
@@ -58,8 +58,8 @@ std::string_view TakeReal(std::string_view text) {
   return text.substr(0, i);
 }
 
-// A real that is too large or too small for its type. std::from_chars does not say which; a stream does: the one is a
-// failure, the other a zero with its sign.
+// Reads a real that is too large or too small for its type. std::from_chars does not distinguish the two; a stream does: it
+// fails for a number that is too large, and reads one that is too small as a zero with its sign.
 template <class TReal>
 TReal ReadExtremeReal(std::string_view text) {
   std::istringstream stream{std::string(text)};

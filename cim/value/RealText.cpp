@@ -12,7 +12,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-// The range in which SixDigitsOf needs no more than 128 bits, and of the powers of five those up to 27.
+// SixDigitsOf handles the numbers in this range, for which 128 bits and the powers of five up to 5^27 are enough.
 constexpr double kLeastExact = 1e-21;
 constexpr double kBeyondExact = 1e22;
 
@@ -25,7 +25,7 @@ constexpr std::array<std::uint64_t, 28> PowersOfFive() {
 }
 constexpr auto kPowersOfFive = PowersOfFive();
 
-// A number in two parts: its whole part, and whether the rest makes it round up, a half to the even neighbour.
+// The integral part of a number, and whether the fraction rounds it up; a half rounds to the even neighbour.
 struct TSplit {
   unsigned int fWhole;
   bool fRoundsUp;
@@ -38,31 +38,31 @@ TSplit SplitBy(unsigned int whole, TUnsigned rest, TUnsigned half) {
 
 // mantissa * 2^exponent * 10^power, exactly.
 TSplit Scale(std::uint64_t mantissa, int exponent, int power) {
-  int const shift = exponent + power;  // the twos of the power of ten join the exponent, and its fives remain
+  int const shift = exponent + power;  // the power of two: 10^power is 2^power * 5^power
   if (power >= 0) {
     TUint128 const product = TUint128(mantissa) * kPowersOfFive[power];
     TUint128 const one = TUint128(1) << -shift;
     return SplitBy(static_cast<unsigned int>(product >> -shift), product & (one - 1), one / 2);
   }
-  std::uint64_t dividend = 2 * mantissa, divisor = 2 * kPowersOfFive[-power];  // doubled, so that half of it is whole
+  std::uint64_t dividend = 2 * mantissa, divisor = 2 * kPowersOfFive[-power];  // doubled: half of it is an integer
   shift >= 0 ? dividend <<= shift : divisor <<= -shift;
   return SplitBy(static_cast<unsigned int>(dividend / divisor), dividend % divisor, divisor / 2);
 }
 
-// A number as digits * 10^(exponent - 5), with digits from 100000 to 999999.
+// The number fDigits * 10^(fExponent - 5), where fDigits is 100000 to 999999.
 struct TSixDigits {
   unsigned int fDigits;
   int fExponent;
 };
 
-// `number` is from kLeastExact up to kBeyondExact.
+// `number` is at least kLeastExact and less than kBeyondExact.
 TSixDigits SixDigitsOf(double number) {
   std::uint64_t bits;
   std::memcpy(&bits, &number, sizeof bits);
   std::uint64_t const mantissa = (bits & 0xFFFFFFFFFFFFF) | 0x10000000000000;
   int const exponent = static_cast<int>(bits >> 52) - 1075;
 
-  int decimal = ((exponent + 52) * 1233) >> 12;  // the decimal exponent, or one less: 1233 / 4096 is the logarithm of 2
+  int decimal = ((exponent + 52) * 1233) >> 12;  // the decimal exponent, or one less: 1233 / 4096 is about log10(2)
   TSplit split = Scale(mantissa, exponent, 5 - decimal);
   if (split.fWhole >= 1000000) split = Scale(mantissa, exponent, 5 - ++decimal);
 

@@ -11,7 +11,7 @@
 
 namespace NQRVZEP20 {
 
-// A scalar CIM type in terms of C++: how it is stored, and the kind of implementation that holds it.
+// The C++ side of a scalar CIM type: the type that stores it, and the kind of TCIMValueImpl that holds it.
 template <class TStorageType, class TKindType>
 struct TScalarType {
   using TStorage = TStorageType;

@@ -22,7 +22,7 @@ TCIMArrayValueImpl::~TCIMArrayValueImpl() = default;
 
 TCIMArrayValueImpl::operator std::vector<TCIMValue>&() const { return fElements; }
 
-// The elements are written to where they stay: numbers, which most arrays hold, without a string of their own.
+// Numbers, the elements of most arrays, are written directly into the result, without a string of their own.
 std::string TCIMArrayValueImpl::ToString(unsigned char radix) const {
   std::string text = "{ ";
   std::size_t length = text.size();

@@ -18,7 +18,7 @@ std::string TCIMChar16Impl::ToString() const {
   return std::to_string(fCode);
 }
 
-// Neither comparison looks at the codes. Kept.
+// The comparisons ignore the codes. Kept.
 
 bool TCIMChar16Impl::operator==(TCIMChar16Impl const& other) const {
   RefuseNull(fIsNull || other.fIsNull);

@@ -21,7 +21,7 @@ void CheckOrThrow(bool isGood) {
 
 bool IsEpochDate(unsigned short year, unsigned short month, unsigned int day) { return year == 1970 && month == 1 && day == 1; }
 
-// A calendar record in standard time. Fields beyond their range stay, for mktime and timegm to normalise.
+// A calendar record in standard time. Fields may be out of range: mktime and timegm normalise them.
 std::tm RecordOf(unsigned short year, unsigned short month, unsigned int day, unsigned short hour, int minute,
                  unsigned short second) {
   std::tm record{};
@@ -35,15 +35,15 @@ std::tm RecordOf(unsigned short year, unsigned short month, unsigned int day, un
   return record;
 }
 
-// For localtime_r, which looks at TZ once.
+// Called before localtime_r, which by itself reads TZ only once.
 void LookAtZone() {
   static thread_local TTimeZone zone;
   if (zone.HasChanged()) ::tzset();
 }
 
-// Whether such a local time has been, or will be, in standard time.
+// Whether the zone has the local time `record` in standard time. False also when two attempts do not find its UTC offset.
 bool IsStandardTime(std::tm record) {
-  static thread_local long gmtOffset = 0;  // seconds; of the time asked for last
+  static thread_local long gmtOffset = 0;  // in seconds; initially the one that the previous call found
   LookAtZone();
   std::time_t const asUTC = ::timegm(&record);
   for (int tries = 0; tries < 2; ++tries) {
@@ -62,7 +62,7 @@ std::tm LocalTime(std::time_t time) {
   return record;
 }
 
-// Sums and products of 64 bits that wrap around where intervals of hundreds of millions of days are too long for them.
+// 64-bit sums and products that wrap around when intervals of hundreds of millions of days overflow them.
 std::int64_t WrappingSum(std::int64_t a, std::int64_t b) {
   return static_cast<std::int64_t>(static_cast<std::uint64_t>(a) + static_cast<std::uint64_t>(b));
 }
@@ -78,7 +78,7 @@ std::uint64_t Magnitude(std::int64_t total) {
 // ---- Text ----
 
 constexpr std::size_t kTextLength = 25;
-constexpr std::size_t kPointPosition = 14;  // what stands there is not examined
+constexpr std::size_t kPointPosition = 14;  // this character is not checked
 constexpr std::size_t kSignPosition = 21;
 
 bool IsDigit(char c) { return c >= '0' && c <= '9'; }
@@ -90,7 +90,7 @@ bool IsWellFormed(std::string_view text) {
   return text[kSignPosition] == '+' || text[kSignPosition] == '-' || text[kSignPosition] == ':';
 }
 
-// The number in that slice of a well-formed text.
+// The number in a slice of a well-formed text.
 template <class T>
 T NumberIn(std::string_view text, std::size_t from, std::size_t length) {
   unsigned int number = 0;
@@ -98,7 +98,7 @@ T NumberIn(std::string_view text, std::size_t from, std::size_t length) {
   return static_cast<T>(number);
 }
 
-// Builds a text of numbers in decimal, filled with zeros to a width. A number wider than that stands whole.
+// Builds a text from decimal numbers, each padded with zeros to a width. A number with more digits is not shortened.
 class TDigits {
 public:
   TDigits& Number(unsigned int number, int width) {
@@ -138,8 +138,8 @@ bool TCIMDateTimeImpl::IsValid(unsigned short year, unsigned short month, unsign
                                unsigned short minute, unsigned short second, unsigned int, short utcOffset) {
   if (IsEpochDate(year, month, day)) return true;
 
-  // mktime fails for a time that was skipped when the zone got another standard time. It is slow: it looks at the file of the
-  // zone, and searches through years in summer.
+  // mktime fails for a local time that the zone skipped when it changed its standard time. It is slow: it checks the zone's
+  // file and, for a time in summer, searches through years. IsStandardTime settles most times without it.
   std::tm record = RecordOf(year, month, day, hour, minute - utcOffset, second);
   bool const isLongAfterEpoch = year >= 1972 && day <= INT_MAX;
   return (isLongAfterEpoch && IsStandardTime(record)) || std::mktime(&record) != -1;
@@ -224,8 +224,8 @@ std::string TCIMDateTimeImpl::ToUIString() const {
 
 // ---- Seconds ----
 
-// `utcOffset` is taken off the minutes: the datetime's own for the instant it denotes, 0 for its fields as they stand.
-// 1 January 1970 stands for the epoch where mktime gives -1.
+// `utcOffset` is subtracted from the minutes: pass fUTCOffset to get the instant that the timestamp denotes, or 0 to read
+// its fields as local time. When mktime returns -1, a date of 1 January 1970 counts as the epoch.
 std::int64_t TCIMDateTimeImpl::SecondsOfTimestamp(int utcOffset) const {
   std::tm record = RecordOf(fYear, fMonth, fDay, fHour, fMinute - utcOffset, fSecond);
   std::time_t const time = std::mktime(&record);
@@ -238,7 +238,7 @@ std::int64_t TCIMDateTimeImpl::SecondsOfInterval() const {
   return std::int64_t{fDay} * 86400 + fHour * 3600 + fMinute * 60 + fSecond;
 }
 
-// As arithmetic counts them: without the UTC offset.
+// The seconds that arithmetic uses: the UTC offset is not applied.
 std::int64_t TCIMDateTimeImpl::Seconds() const { return fIsInterval ? SecondsOfInterval() : SecondsOfTimestamp(0); }
 
 // ---- Comparison ----
@@ -271,8 +271,8 @@ TCIMDateTimeImpl TCIMDateTimeImpl::IntervalOf(std::int64_t total) {
   return interval;
 }
 
-// The timestamp's fields are in standard time. Of a negative total the seconds lose their sign, while the microseconds wrap
-// around to a number above four thousand million; nothing is examined here. Kept.
+// The timestamp's fields are in standard time and are not validated: for a negative total the seconds lose their sign, and
+// the microseconds wrap around to a number above four thousand million. Kept.
 TCIMDateTimeImpl TCIMDateTimeImpl::TimestampOf(std::int64_t total, short utcOffset) {
   std::int64_t const seconds = std::abs(total / kMicroSecondsPerSecond);
   std::tm record = LocalTime(seconds);
@@ -304,8 +304,8 @@ TCIMDateTimeImpl TCIMDateTimeImpl::operator-(TCIMDateTimeImpl const& other) cons
   if (fIsInterval && other.fIsInterval) return IntervalOf(TotalOf(Seconds() - other.Seconds(), microSeconds));
   if (!fIsInterval && !other.fIsInterval) return IntervalOf(TotalOf(Instant() - other.Instant(), microSeconds));
 
-  // Only the seconds lose their sign. So where an interval stands before a timestamp, the microseconds enter crosswise: the
-  // timestamp's are taken off the interval's. Kept.
+  // Only the difference of the seconds loses its sign. For interval - timestamp the microseconds therefore enter crosswise:
+  // the timestamp's are subtracted from the interval's. Kept.
   return TimestampOf(TotalOf(std::abs(Seconds() - other.Seconds()), microSeconds), fIsInterval ? other.fUTCOffset : fUTCOffset);
 }
 

@@ -21,7 +21,7 @@ void RequireDecimal(unsigned char radix) {
   if (radix != 10) throw TZEPException(kZEPStatusNotSupported);
 }
 
-// Writes a number at `place` and returns the end of its text. Room as IntegerText.h says.
+// Writes a number to `place` and returns the end of the text. IntegerText.h says how much room it needs.
 template <class TNumber>
 char* PutNumber(char* place, TNumber number, unsigned char radix) {
   if constexpr (std::is_same_v<TNumber, bool>) {
@@ -45,7 +45,7 @@ std::string LongTextOf(TNumber number, unsigned char radix) {
   return std::string(text, PutNumber(text, number, radix));
 }
 
-// Writes straight into a string that was made without allocation.
+// Writes directly into a string that is short enough to need no allocation.
 template <class TNumber>
 std::string ShortTextOf(TNumber number, unsigned char radix) {
   std::string text("               ", kRoomForShort);

@@ -81,7 +81,7 @@ TCIMValue::TData TCIMValue::TData::CopyOf(TCIMType type, TData const& other) {
 TCIMValue::TData::TData(TData&& other) noexcept { Take(other); }
 
 TCIMValue::TData& TCIMValue::TData::operator=(TData&& other) noexcept {
-  TData const old(std::move(*this));  // it goes last: `other` may be part of it
+  TData const old(std::move(*this));  // destroyed last, because `other` may be part of it
   Take(other);
   return *this;
 }
@@ -164,7 +164,7 @@ TCIMValue& TCIMValue::operator=(TCIMValue const& other) {
 
 TCIMValue& TCIMValue::operator=(TCIMValue&& other) {
   if (*this == other) return *this;
-  TCIMValue taken(std::move(other));  // `other` may be one of this value's own elements, which go with the old data
+  TCIMValue taken(std::move(other));  // `other` may be an element of this value, destroyed with the old data
   TakeFrom(taken);
   return *this;
 }
@@ -227,7 +227,7 @@ void TCIMValue::Set(TCIMReference& value) {
 void TCIMValue::Set(TCIMType type, unsigned int maxArraySize, std::vector<TCIMValue> const& elements) {
   SetData(ArrayOf(type), TData(std::make_unique<TCIMArrayValueImpl>(elements)));
   fMaxArraySize = maxArraySize;
-  RequireElementsOf(ElementOf(type), *this);  // the copy: `elements` may have been this value's own
+  RequireElementsOf(ElementOf(type), *this);  // checks the copy: `elements` may have been this value's own
 }
 
 void TCIMValue::SetReferencedClass(boost::shared_ptr<ICIMClass> referencedClass) {
@@ -260,7 +260,7 @@ TCIMValue::operator TCIMDateTime() const { return DataAs(TType::kCIMTypeDateTime
 TCIMValue::operator TCIMReference() const { return DataAs(TType::kCIMTypeReference).operator TCIMReference(); }
 
 TCIMValue::operator std::vector<TCIMValue>&() const {
-  return DataAs(ArrayOf(fType)).operator std::vector<TCIMValue>&();  // any array will do
+  return DataAs(ArrayOf(fType)).operator std::vector<TCIMValue>&();  // accepts an array of any type
 }
 
 std::string TCIMValue::ToString(unsigned char radix) const {
