@@ -6,7 +6,7 @@
 
 namespace NQRVZEP20 {
 
-// What the destination of a copy answered; throws kZEPStatusNotFound when that is an empty pointer.
+// Returns `answer`, a pointer that the destination of a copy returned; throws kZEPStatusNotFound when it is empty.
 template <class T>
 boost::shared_ptr<T> Required(boost::shared_ptr<T> answer) {
   if (!answer) throw TZEPException(kZEPStatusNotFound);

@@ -15,14 +15,14 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr std::size_t kNowhere = std::string::npos;
-constexpr int kMaxDepth = 100;  // of references among the keys of references; a path comes from outside
+constexpr int kMaxDepth = 100;  // nesting of references in keys; limited because paths are foreign input
 
 [[noreturn]] void ThrowInvalidReference(std::string_view reason, std::string const& path) {
   LogError(reason, path);
   throw TZEPException(kZEPStatusInvalidReference);
 }
 
-// The "." between class and keys. Only one behind a ":" counts, so that without a namespace prefix a path has no keys. Kept.
+// The "." between class and keys. Only a "." after a ":" counts, so a path without a namespace prefix has no keys. Kept.
 std::size_t FindEndOfClass(std::string const& path, std::size_t pos) {
   std::size_t const colon = path.find(':', pos);
   return colon == kNowhere ? kNowhere : path.find('.', colon);
@@ -32,8 +32,8 @@ bool IsEndOfKeys(std::string const& path, std::size_t pos, bool isNested) {
   return pos >= path.size() || (isNested && path[pos] == '"');
 }
 
-// Reads a quoted text; `pos` goes from its opening to its closing quote. A backslash before anything but a quote or a
-// backslash is kept, with what follows it.
+// Reads a quoted text and moves `pos` from its opening to its closing quote. A backslash escapes a quote or a backslash;
+// before any other character it is kept.
 std::string ReadQuotedText(std::string const& path, std::size_t& pos) {
   std::string text;
   for (++pos; pos < path.size(); ++pos) {
@@ -61,7 +61,7 @@ void AppendEscaped(std::string& path, std::string_view text) {
   }
 }
 
-// A plug-in reports an unknown property in either of two ways, by kZEPStatusNotFound or by an empty pointer. Both throw
+// A plug-in may report an unknown property by throwing kZEPStatusNotFound or by returning an empty pointer. Both throw
 // kZEPStatusNotFound here.
 boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(ICIMClass const& cls, std::string const& name) {
   auto declaration = cls.GetPropertyDecl(name, TCIMContext());
@@ -69,7 +69,7 @@ boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(ICIMClass const& cls, s
   return declaration;
 }
 
-// What the < of two vectors says, with each name compared once.
+// The result of < for two vectors, but each name is compared only once.
 template <class TKeyBindings>
 bool AreKeysLess(TKeyBindings const& a, TKeyBindings const& b) {
   auto mine = a.begin();
@@ -115,7 +115,7 @@ std::string TCIMReferenceImpl::GetPath() const {
     path += name;
     path += "=\"";
     if (value.IsReference())
-      path += value.ToString(10);  // raw, quotes and all. Kept.
+      path += value.ToString(10);  // raw: quotes are not escaped. Kept.
     else
       AppendEscaped(path, value.ToString(10));
     path += "\",";
@@ -133,7 +133,7 @@ void TCIMReferenceImpl::SetPath(std::string const& path) {
 }
 
 void TCIMReferenceImpl::ParsePath(TCIMReferenceImpl& target, std::string const& path, std::size_t& pos) {
-  boost::shared_ptr<ICIMNamespace> const ns(target.fNamespace);  // held until the path is read
+  boost::shared_ptr<ICIMNamespace> const ns(target.fNamespace);  // keeps the namespace alive until the path is read
   bool const isNested = pos != 0;
   if (isNested) ++pos;  // the opening quote
 
@@ -154,7 +154,7 @@ void TCIMReferenceImpl::ReadClass(ICIMNamespace const& ns, std::string const& pa
   }
 }
 
-// Reads `,name="value"` and returns the position behind it.
+// Reads `,name="value"` and returns the position after it.
 std::size_t TCIMReferenceImpl::ReadKeyBinding(boost::shared_ptr<ICIMNamespace> const& ns, std::string const& path,
                                               std::size_t pos) {
   if (path[pos] != ',' && path[pos] != '.') ThrowInvalidReference("Reference missing '.' or ',', path=", path);
@@ -181,7 +181,7 @@ boost::shared_ptr<ICIMPropertyDecl const> TCIMReferenceImpl::ReadDeclaration(std
   }
 }
 
-// Reads a path between quotes, which are not escaped inside it; `pos` goes from the opening to the closing quote.
+// Reads a path between quotes and moves `pos` from the opening to the closing quote. Quotes inside the path are not escaped.
 TCIMValue TCIMReferenceImpl::ReadReference(boost::shared_ptr<ICIMNamespace> const& ns, std::string const& path,
                                            std::size_t& pos) const {
   if (fDepth == kMaxDepth) ThrowInvalidReference("Reference nested too deeply, path=", path);
@@ -201,11 +201,12 @@ void TCIMReferenceImpl::SetClass(boost::shared_ptr<ICIMClass> cls) {
 std::string TCIMReferenceImpl::GetClassName() const { return fClass->GetName(TCIMContext()); }
 
 void TCIMReferenceImpl::SetClassName(std::string const& name) {
-  boost::shared_ptr<ICIMNamespace> const ns(fNamespace);  // throws boost::bad_weak_ptr when it is gone
+  boost::shared_ptr<ICIMNamespace> const ns(fNamespace);  // throws boost::bad_weak_ptr when it was destroyed
   LookUpClass(*ns, name);
 }
 
-// An unknown class, too, may be reported by an empty pointer. Both throw kZEPStatusNotFound here.
+// A plug-in may report an unknown class, too, by throwing kZEPStatusNotFound or by returning an empty pointer. Both throw
+// kZEPStatusNotFound here.
 void TCIMReferenceImpl::LookUpClass(ICIMNamespace const& ns, std::string const& name) {
   boost::shared_ptr<ICIMClass> cls = ns.GetClass(name, fContext);
   if (!cls) throw TZEPException(kZEPStatusNotFound);

@@ -31,13 +31,13 @@ constexpr char kUnknownModel[] = "xxx";
 
 // ---- Reading ----
 
-// The caller's context, and the provider to ask unless the caller names one.
+// Adds the name of the plug-in provider to the caller's context, unless the caller names a provider.
 TCIMContext QueryContext(TCIMContext context = TCIMContext()) {
   context.emplace(TCIMSchemaHelper::kContextName, TCIMValue(TCIMSchemaHelper::kPluginNSPName));
   return context;
 }
 
-// Runs a lookup; empty when it throws kZEPStatusNotFound.
+// Returns the result of a lookup, or an empty pointer when the lookup throws kZEPStatusNotFound.
 template <class TLookup>
 auto FindOrEmpty(TLookup lookup) -> decltype(lookup()) {
   try {
@@ -68,7 +68,7 @@ TInstances InstancesOf(ICIMClass const& cls, TCIMContext const& context) {
   return instances;
 }
 
-// The property of the only instance of the class. Whatever is missing throws kZEPStatusNotFound and is not logged.
+// Reads a property of the only instance of a class. Anything missing throws kZEPStatusNotFound and is not logged.
 std::string ReadOnlyInstance(ICIMNamespace const& ns, std::string const& className, std::string const& propertyName,
                              TCIMContext const& context) {
   auto const cls = FindClass(ns, className, context);
@@ -86,7 +86,8 @@ template <class... TPieces>
   throw TZEPException(kZEPStatusNotFound);
 }
 
-// The same for the computer system, but each reason is logged, and NULL and what is no string count as missing.
+// Reads a property of the computer system in the same way, but logs each failure, and treats a value that is NULL or not a
+// string as missing.
 std::string ReadComputerSystem(ICIMNamespace const& ns, std::string const& propertyName, TCIMContext const& context) {
   auto const cls = FindClass(ns, TCIMSchemaHelper::kSystemCreationClassName, context);
   if (!cls) ThrowNotFound("TCIMSchemaHelper: no computer system");
@@ -101,7 +102,7 @@ std::string ReadComputerSystem(ICIMNamespace const& ns, std::string const& prope
   return value;
 }
 
-// The values of a property in every instance of a class, without the NULL ones.
+// The values that a property has in the instances of a class; NULL values are left out.
 std::vector<TCIMValue> ReadEveryInstance(TInstances const& instances, std::string const& propertyName,
                                          TCIMContext const& context) {
   std::vector<TCIMValue> values;
@@ -121,7 +122,7 @@ TInstances FindInstances(ICIMNamespace const& ns, std::string const& className, 
 
 bool IsString(TCIMValue const& value) { return value.GetType() == TCIMValue::TCIMType::kCIMTypeString && !value.IsNull(); }
 
-// Hosts give a build number as a text or as a number.
+// Some hosts report the build number as a string, others as an integer.
 bool IsStringOrInteger(TCIMValue const& value) {
   TCIMValue::TCIMType const type = value.GetType();
   return IsString(value) || (type >= TCIMValue::TCIMType::kCIMTypeUint8 && type <= TCIMValue::TCIMType::kCIMTypeSint64);
@@ -139,7 +140,7 @@ void RemoveTrailingBlanks(std::string& text) { text.erase(text.find_last_not_of(
 
 // ---- Machine type and model ----
 
-// Product names of older servers, which carry the MTM at a fixed place behind the model name.
+// Product names of older servers, which have the MTM at a fixed position after the model name.
 struct TLegacyName {
   std::size_t fLength;
   std::string_view fPrefix;  // the MTM follows it
@@ -168,7 +169,7 @@ std::string MTMWithoutBrackets(std::string const& text) {
   throw TZEPException(kZEPStatusInvalidFormat);
 }
 
-// `bracket` is where "-[" stands.
+// `bracket` is the position of "-[".
 std::string MTMInBrackets(std::string const& text, std::size_t bracket) {
   std::string const code = text.substr(bracket + 2, 7);
   if (HasCharacterAt(text, bracket + 9, ']') && TCIMSchemaHelper::IsValidMTM(code)) return code;
@@ -189,7 +190,7 @@ std::string MTMFrom(std::string const& productName) {
 
 bool IsPlaceholder(std::string const& serialNumber) { return serialNumber == "XxXxXxX" || serialNumber == "none"; }
 
-// What stands behind the ":" of the first entry that has one.
+// The text after the ":" of the first entry that contains one.
 std::optional<std::string> IdentifyingInfoIn(std::vector<TCIMValue> const& entries) {
   for (TCIMValue const& entry : entries) {
     if (!IsString(entry)) continue;

@@ -11,7 +11,7 @@ boost::shared_ptr<TNamespaceProviderManager> TNamespaceProviderManager::fgInstan
 
 namespace {
 
-// Makes the registry when the library is loaded, before any plug-in can register and before there is a second thread.
+// Creates the registry when the library is loaded, before any plug-in can register and before there is a second thread.
 bool ManagerInit() {
   TNamespaceProviderManager::GetInstance();
   return true;
@@ -30,7 +30,7 @@ TNamespaceProviderManager::~TNamespaceProviderManager() = default;
 
 void TNamespaceProviderManager::RegisterNamespaceProvider(boost::shared_ptr<INamespaceProvider> provider) {
   std::string const& name = provider->GetName(TCIMContext());
-  fProviders.emplace(name, provider);  // the first provider of a name stays, without a word. Kept.
+  fProviders.emplace(name, provider);  // the first provider of a name stays; others are dropped silently. Kept.
 }
 
 boost::shared_ptr<INamespaceProvider> TNamespaceProviderManager::GetNamespaceProvider(std::string const& name) const {
