@@ -27,8 +27,8 @@ std::string IIPMILan::m_LANMapping[MAXMULTINODE] = {
 
 namespace {
 
-constexpr std::ptrdiff_t kCompletionCode = 6;           // its place in a message
-constexpr std::ptrdiff_t kAuthenticationType = 4;       // its place in a packet
+constexpr std::ptrdiff_t kCompletionCode = 6;           // offset in a message
+constexpr std::ptrdiff_t kAuthenticationType = 4;       // offset in a packet
 constexpr std::ptrdiff_t kAuthenticationCodeSize = 16;  // bytes, between the session header and the length
 
 bool HasEntry(int node) { return node >= 0 && node < IIPMILan::MAXMULTINODE; }
@@ -42,7 +42,7 @@ char ChecksumOf(char const* bytes, std::ptrdiff_t first, std::ptrdiff_t last) {
   return static_cast<char>(-sum);
 }
 
-// A length that is negative leads back to places in front of the message, which may lie in front of the packet.
+// The length is a signed byte. A negative one leads to a byte before the message, possibly before the packet.
 bool IsChecksumRight(char const* packet, std::ptrdiff_t lengthPlace) {
   if (lengthPlace < 0) return false;
   const std::ptrdiff_t message = lengthPlace + 1;
@@ -58,7 +58,7 @@ bool IsCompleted(char const* packet, std::ptrdiff_t lengthPlace) {
 }  // namespace
 
 IIPMILan* IIPMILan::Initialize() {
-  fgipmilanInstance = std::unique_ptr<IIPMILan>(new IIPMILan(fgipmilanInstance)).release();  // to the end of the process
+  fgipmilanInstance = std::unique_ptr<IIPMILan>(new IIPMILan(fgipmilanInstance)).release();  // lives until the end of the process
   return fgipmilanInstance;
 }
 
@@ -143,7 +143,7 @@ bool IIPMILan::getipmiLanStatus() {
   return fIsResponseValid;
 }
 
-// ---- What a caller needs that speaks the protocol itself ----
+// ---- For callers that speak the protocol themselves ----
 
 std::uint64_t IIPMILan::getSeqNum() {
   ++fSequence;
@@ -155,7 +155,7 @@ void IIPMILan::getIPMISessionID(char* output, int count) {
   if (count >= 1 && count < static_cast<int>(m_sessionID.size())) std::copy_n(m_sessionID.begin(), count, output);
 }
 
-// The size is not asked. Kept.
+// The size is ignored. Kept.
 void IIPMILan::getBMCPassword(char* output, int /*size*/) { std::copy(m_password.begin(), m_password.end(), output); }
 
 void IIPMILan::getIPMIAddress(char* output, int /*size*/) { std::copy(m_address.begin(), m_address.end(), output); }

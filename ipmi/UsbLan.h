@@ -2,7 +2,7 @@
 
 namespace NQRVZEP20 {
 
-// Brings up the USB-LAN of every node through ./ovdusblan.so, as IIPMILan::bringupOvdLan says.
+// Brings up the USB-LAN of every node through ./ovdusblan.so. IIPMILan::bringupOvdLan documents the result.
 bool BringUpUsbLan();
 
 }  // namespace NQRVZEP20

@@ -39,7 +39,7 @@ constexpr int kBindPauseSeconds = 3;
 constexpr int kCommandSilenceSeconds = 300;
 constexpr std::size_t kHardwareAddressSize = 6;
 
-// Where the fields of a DHCP message lie.
+// Offsets of the fields of a DHCP message.
 constexpr std::size_t kXidOffset = 4;
 constexpr std::size_t kCiaddrOffset = 12;
 constexpr std::size_t kChaddrOffset = 28;
@@ -49,7 +49,8 @@ constexpr std::size_t kMagicCookieOffset = 236;
 
 bool BeginsWith(std::string_view text, std::string_view beginning) { return text.substr(0, beginning.size()) == beginning; }
 
-// An address as inet_pton reads it, and nothing else, into as many bytes as one of the family has.
+// Reads an address as inet_pton does and stores its bytes in `bytes`, which has room for an address of the family. False
+// when the text is anything but an address.
 bool ReadAddress(int family, std::string const& text, void* bytes) {
   bool const isOneText = text.find('\0') == std::string::npos;
   return isOneText && ::inet_pton(family, text.c_str(), bytes) == 1;
@@ -69,7 +70,7 @@ bool IsHardwareAddress(std::string const& text) {
   return true;
 }
 
-// What the command prints; empty when it cannot be run.
+// The output of a command; empty when the command cannot be run.
 std::string OutputOf(std::string const& program, std::vector<std::string> const& arguments) {
   try {
     return TOSSpecific::SpawnProcess(program, arguments, kCommandSilenceSeconds);
@@ -78,7 +79,7 @@ std::string OutputOf(std::string const& program, std::vector<std::string> const&
   }
 }
 
-// The number that a line of "ps" begins with.
+// The process number at the start of a line of "ps".
 std::string ProcessNumberOf(std::string_view line) {
   constexpr std::string_view kDigits = "0123456789";
   line.remove_prefix(std::min(line.find_first_not_of(' '), line.size()));
@@ -86,12 +87,12 @@ std::string ProcessNumberOf(std::string_view line) {
 }
 
 void EndProcess(std::string const& number) {
-  // The null device is misspelt: the output lands in a file of that name. Kept.
+  // The null device is misspelt: the output goes to a file of that name. Kept.
   std::string const command = "kill " + number + " > /dev/nul 2>&1";
   [[maybe_unused]] int const ignored = std::system(command.c_str());
 }
 
-// The first address that "ifconfig" shows, without its prefix length; empty when it shows none in this form.
+// The first address that "ifconfig" prints after the label, without its prefix length; empty when the label is missing.
 std::string ShownIPV6Address() {
   constexpr std::string_view kLabel = "inet6 addr: ";
   std::string const shown = OutputOf("ifconfig", {});
@@ -107,11 +108,11 @@ struct TInterface {
   std::string name, address, hardwareAddress;
 };
 
-// The names that the system lists, each once: one with several addresses is listed as often.
+// The names of the interfaces, each once; the system lists an interface once for each of its addresses.
 std::vector<std::string> ListInterfaces(int query) {
   std::vector<std::string> names;
   ifconf list{};
-  bool isListed = ::ioctl(query, SIOCGIFCONF, &list) == 0;  // how long the list is
+  bool isListed = ::ioctl(query, SIOCGIFCONF, &list) == 0;  // asks for the length of the list
   std::vector<ifreq> entries(static_cast<std::size_t>(list.ifc_len) / sizeof(ifreq));
   list.ifc_req = entries.data();
   if (isListed && !entries.empty()) isListed = ::ioctl(query, SIOCGIFCONF, &list) == 0;
@@ -151,7 +152,7 @@ std::string HardwareAddressIn(ifreq const& answer) {
   return text;
 }
 
-// False, with the reason in the log, when something cannot be read. An interface that is down counts as well.
+// Reads the addresses of an interface, which may be down. Logs the reason and returns false when something cannot be read.
 bool ReadInterface(int query, std::string const& name, TInterface& interface) {
   interface.name = name;
   ifreq answer;
@@ -169,7 +170,7 @@ bool ReadInterface(int query, std::string const& name, TInterface& interface) {
   return true;
 }
 
-// ---- Asking ----
+// ---- The query ----
 
 struct TFree {
   void operator()(unsigned char* bytes) const noexcept { std::free(bytes); }
@@ -177,7 +178,7 @@ struct TFree {
 using TMessage = std::unique_ptr<unsigned char, TFree>;
 using TReply = std::array<unsigned char, AutoProxyDiscovery::kMessageSize>;
 
-// Whatever comes to the port is a reply; its transaction number is not compared. Kept.
+// Any packet that arrives at the port counts as the reply; its transaction number is not compared. Kept.
 bool Receive(int receiver, TReply& reply) {
   AutoProxyDiscovery::readable_timeo(receiver, kReplySeconds);
   if (::recv(receiver, reply.data(), reply.size(), 0) >= 0) return true;
@@ -185,7 +186,8 @@ bool Receive(int receiver, TReply& reply) {
   return false;
 }
 
-// The options of the reply that ends the attempts; what the reply does not fill is 0.
+// Sends the message up to three times, until a packet arrives, and returns the URL in that reply; empty when there is none.
+// Bytes that the reply does not fill are 0.
 std::string SendAndReceive(int sender, int receiver, unsigned char const* message) {
   TReply reply{};
   for (int attempt = 1; attempt <= kSendAttempts; ++attempt) {
@@ -205,7 +207,7 @@ std::string Ask(TInterface interface) {
   return message ? SendAndReceive(sender.get(), receiver.get(), message.get()) : "";
 }
 
-// Leaves in `interface` what was read last.
+// Queries through each "eth" interface until one gives a URL. On return `interface` holds the data read last.
 std::string AskForEachInterface(TInterface& interface) {
   TUniqueFd const query(::socket(AF_INET, SOCK_DGRAM, 0));
   if (!query) {
@@ -263,11 +265,11 @@ void AutoProxyDiscovery::wpadPreconfig() {
 
 unsigned char* AutoProxyDiscovery::make_message(std::string const& address, std::string const& hardwareAddress,
                                                 unsigned char*& message) {
-  constexpr unsigned char kHead[] = {1, 1, kHardwareAddressSize, 0};  // a request, over Ethernet, with its address size, no hops
-  constexpr std::uint32_t kXid = 1983;                                // in the machine's byte order, and always the same. Kept.
+  constexpr unsigned char kHead[] = {1, 1, kHardwareAddressSize, 0};  // request, Ethernet, size of its addresses, no hops
+  constexpr std::uint32_t kXid = 1983;                                // always the same, in the machine's byte order. Kept.
   constexpr unsigned char kOptions[] = {0x63, 0x82, 0x53, 0x63,       // the magic cookie
-                                        0x35, 0x01, 0x08,             // the kind of message: DHCPINFORM
-                                        0x37, 0x01, 0xfc,             // asked for: option 252
+                                        0x35, 0x01, 0x08,             // message type: DHCPINFORM
+                                        0x37, 0x01, 0xfc,             // requested: option 252
                                         0xff};
   message = static_cast<unsigned char*>(xzalloc(kMessageSize));
   if (message == nullptr) return nullptr;
@@ -340,7 +342,7 @@ int AutoProxyDiscovery::open_recv_socket(char*) {
   }
   for (int attempt = 1; !BindTo(receiver.get(), AddressOf(INADDR_ANY, kClientPort)); ++attempt) {
     LogDebug("bind to DHCP_CLIENT_PORT failed!");
-    if (attempt == kBindAttempts) break;  // and the socket has no port. Kept.
+    if (attempt == kBindAttempts) break;  // the socket is returned without a port. Kept.
     ::sleep(kBindPauseSeconds);
   }
   return receiver.release();
@@ -365,10 +367,10 @@ std::string AutoProxyDiscovery::dhcp_parser(unsigned char* options) {
     std::size_t const length = options[at + 1];
     std::size_t const next = at + 2 + length;
     if (options[at] == kUrl) {
-      // A value that does not end within the area is none: half a URL leads elsewhere.
+      // A value that does not end within the area counts as missing: half a URL would lead elsewhere.
       return next <= kOptionsSize ? std::string(options + at + 2, options + next) : "";
     }
-    at = next;  // also over pads, which are read with a length. Kept.
+    at = next;  // a pad, too, is read as if a length followed it. Kept.
   }
   return "";
 }
