@@ -1,4 +1,4 @@
-// A configuration file of 100,000 lines beside GLib's GKeyFile: with its keys in order, and in any order.
+// Compares reading a configuration file of 100,000 lines with GLib's GKeyFile, for sorted and for shuffled keys.
 
 #include "TConfig.h"
 
@@ -21,7 +21,7 @@ using NQRVZEP20::TConfig;
 
 constexpr std::size_t kLines = 100000;
 
-// Works in a directory with both files of the same settings: "zep.cfg", and "zep.ini" with a group for GKeyFile.
+// Works in a directory that holds the same settings twice: in "zep.cfg", and with a group in "zep.ini" for GKeyFile.
 class TSettingsDirectory {
 public:
   explicit TSettingsDirectory(bool inOrder) : fOld(std::filesystem::current_path()) {

@@ -1,5 +1,5 @@
-// Datetime text beside its peers: reading beside GLib's GDateTime, printing beside snprintf. Each round goes through the
-// same points in time, winter and summer.
+// Compares datetime text with its peers: reading with GLib's GDateTime, printing with snprintf. Each round uses the same
+// points in time, in winter and in summer.
 
 #include "TCIMDateTime.h"
 #include "TOSSpecific.h"
@@ -67,7 +67,7 @@ void Print_snprintf(benchmark::State& state) {
 }
 BENCHMARK(Print_snprintf);
 
-// Without a peer: the logger asks several times a line.
+// Has no peer. The logger reads the time several times for each line.
 void LocalTime_Zep(benchmark::State& state) {
   for (auto _ : state) {
     TCIMDateTime now = TOSSpecific::GetLocalTime();

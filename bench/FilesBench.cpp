@@ -1,5 +1,5 @@
-// Files beside GLib, Qt (where it is installed), the standard library and cp: a large file and a pseudo-file read, a large
-// file and a tree copied, a directory listed.
+// Compares file operations with GLib, Qt (where it is installed), the standard library and cp: reading a large file and a
+// pseudo-file, copying a large file and a tree, listing a directory.
 
 #include "TOSSpecific.h"
 
@@ -25,7 +25,7 @@ using NQRVZEP20::TOSSpecific;
 
 constexpr std::size_t kGibibyte = std::size_t{1} << 30;
 
-// A directory that holds what the benchmarks work on, made when it is first asked for.
+// A directory for the files that the benchmarks work on. Each file or tree is created on first use.
 class TWorkshop {
 public:
   TWorkshop() {
@@ -72,7 +72,7 @@ private:
 
 // ---- Reading ----
 
-using TReadSize = std::size_t (*)(char const*);  // reads the whole file and returns its size
+using TReadSize = std::size_t (*)(char const*);  // reads the complete file and returns its size
 
 std::size_t SizeByZep(char const* path) { return TOSSpecific::CaptureFile(path).size(); }
 
@@ -180,7 +180,7 @@ void List(benchmark::State& state, std::vector<std::string> (*names)(std::string
 BENCHMARK_CAPTURE(List, Zep, NamesByZep)->Name("List_Zep");
 BENCHMARK_CAPTURE(List, GDir, NamesByGDir)->Name("List_GDir");
 
-// Without a place for the names.
+// Does not store the names.
 void List_GDirNamesOnly(benchmark::State& state) {
   std::string const path = gWorkshop.LongDirectory();
   for (auto _ : state) {

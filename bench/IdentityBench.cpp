@@ -1,5 +1,5 @@
-// The identity of a machine (type, name, model and serial number) out of an SMBIOS table of 7 KB, the bundled sample, beside
-// what a script would do: run dmidecode for the serial number alone.
+// Compares reading the identity of a machine (type, name, model and serial number) from the bundled sample, an SMBIOS table
+// of 7 KB, with what a script would do: run dmidecode for the serial number alone.
 
 #include "TOSSpecific.h"
 
@@ -29,7 +29,7 @@ void Identity_Zep(benchmark::State& state) {
 }
 BENCHMARK(Identity_Zep);
 
-// What it prints, read through a pipe; empty when it cannot be run.
+// The program's output, read through a pipe; empty when the program cannot be run.
 std::string SerialNumberOfDmidecode() {
   int pipe[2];
   if (::pipe2(pipe, O_CLOEXEC) != 0) return "";

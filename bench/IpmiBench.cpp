@@ -1,5 +1,6 @@
-// The identity of remote servers from simulated controllers, by zep and by ipmitool, each run as a program; a list of a hundred
-// controllers beside the slowest of them; and the checksum of a message. Runs in a network namespace of its own, as root.
+// Compares zep with ipmitool, each run as a program, for reading the identity of a remote server from a simulated
+// controller; a query of a hundred controllers with a query of the slowest one alone; and the checksum of a message with a
+// plain loop. Needs root, to create its own network namespace.
 
 #include "IIPMILan.h"
 
@@ -26,7 +27,7 @@
 namespace {
 
 constexpr int kControllers = 4;               // simulators; each has room for 63 sessions
-constexpr char const* kSilent = "192.0.2.2";  // an address where nobody answers
+constexpr char const* kSilent = "192.0.2.2";  // an address that never answers
 
 std::string AddressOf(int controller) { return "127.2.0." + std::to_string(controller % kControllers + 1); }
 
@@ -34,7 +35,7 @@ void Do(std::string const& command) {
   if (std::system(command.c_str()) != 0) throw std::runtime_error("failed: " + command);
 }
 
-// The network in which all runs: controllers on loopback, and an interface behind which all is silent.
+// The network in which everything runs: the controllers on loopback, and an interface to an address that never answers.
 class TNetwork {
 public:
   TNetwork() {
@@ -71,7 +72,7 @@ std::string FileOf(std::string const& name, std::string const& text) {
   return path;
 }
 
-// Runs a program with its output read; its exit status and the output.
+// Runs a program and returns its exit status and its output.
 std::pair<int, std::string> OutputOf(std::vector<std::string> const& command) {
   int ends[2];
   if (::pipe2(ends, O_CLOEXEC) != 0) return {-1, ""};
@@ -111,7 +112,7 @@ void Identity_Zep(benchmark::State& state) {
 }
 BENCHMARK(Identity_Zep)->UseRealTime();
 
-// The same three reads in one session.
+// The same three reads as zep, but in one session.
 void Identity_ipmitool(benchmark::State& state) {
   UseNetwork();
   std::string const reads = FileOf(".reads",
@@ -124,7 +125,7 @@ void Identity_ipmitool(benchmark::State& state) {
 }
 BENCHMARK(Identity_ipmitool)->UseRealTime();
 
-// A hundred controllers at once, ten of them silent.
+// A hundred controllers at once, ten of which do not answer.
 void Hundred_Zep(benchmark::State& state) {
   UseNetwork();
   std::string hosts;
@@ -145,7 +146,7 @@ BENCHMARK(Slowest_Zep)->UseRealTime()->Iterations(1)->Repetitions(2);
 
 constexpr int kMessageSize = 200;
 
-// Where the message ends, as neither of the two knows it before.
+// The offset of the message's last byte, which the compiler cannot know in advance.
 int LastPlace() {
   int last = kMessageSize - 1;
   benchmark::DoNotOptimize(last);
@@ -164,7 +165,7 @@ void Checksum_Zep(benchmark::State& state) {
   benchmark::DoNotOptimize(bytes);
   NQRVZEP20::IIPMILan& link = *NQRVZEP20::IIPMILan::Initialize();
   for (auto _ : state) {
-    benchmark::ClobberMemory();  // the bytes may have changed: they are summed each time
+    benchmark::ClobberMemory();  // the compiler must assume changed bytes and sum them each time
     char sum = link.GenSum(message.data(), 0, LastPlace());
     benchmark::DoNotOptimize(sum);
   }
@@ -176,7 +177,7 @@ void Checksum_Loop(benchmark::State& state) {
   char* const bytes = message.data();
   benchmark::DoNotOptimize(bytes);
   for (auto _ : state) {
-    benchmark::ClobberMemory();  // the bytes may have changed: they are summed each time
+    benchmark::ClobberMemory();  // the compiler must assume changed bytes and sum them each time
     unsigned char sum = 0;
     int const last = LastPlace();
     for (int n = 0; n <= last; ++n)

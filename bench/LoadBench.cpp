@@ -1,4 +1,5 @@
-// Loading the core library beside an empty one, each time in a fresh process, which measures the one call of dlopen itself.
+// Compares loading the core library with loading an empty one. Each load runs in a fresh process, which itself measures its
+// call of dlopen.
 
 #include <benchmark/benchmark.h>
 #include <stdio.h>
@@ -9,7 +10,7 @@
 
 namespace {
 
-// Seconds, or below 0 when it failed.
+// The time in seconds; negative when loading failed.
 double TimeToLoad(char const* library) {
   FILE* const program = ::popen((std::string(ZEP_LOAD_PROGRAM) + " " + library).c_str(), "r");
   if (program == nullptr) return -1;
@@ -18,7 +19,7 @@ double TimeToLoad(char const* library) {
   return ::pclose(program) == 0 && isTold ? nanoseconds / 1e9 : -1;
 }
 
-// Each measurement is the median of some loads: a process that is interrupted between does not count.
+// Each measurement is the median of several loads, so that an interrupted process does not count.
 double MedianTimeToLoad(char const* library) {
   std::array<double, 21> seconds;
   for (double& one : seconds) one = TimeToLoad(library);

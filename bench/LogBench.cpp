@@ -1,5 +1,5 @@
-// Log entries beside spdlog's: one below the threshold, and one that is written to a file and flushed. Both loggers are
-// reached as callers reach them, through the process's accessor.
+// Compares log entries with spdlog's: one that the threshold drops, and one that is written to a file and flushed. Both
+// loggers are reached as callers reach them, through the accessor function.
 
 #include "TLogger.h"
 #include "TRootObject.h"
@@ -33,7 +33,7 @@ private:
   char fPath[32] = "/tmp/zep-log-bench.XXXXXX";
 };
 
-// Both with an open file, from severity Status (info) on.
+// Both loggers have an open file and write entries of severity Status (info) and more severe ones.
 class TLoggers {
 public:
   TLoggers() {
@@ -58,7 +58,7 @@ void FilteredCall_spdlog(benchmark::State& state) {
 }
 BENCHMARK(FilteredCall_spdlog);
 
-// At Debug, so that nothing is recorded in the in-memory list, which spdlog has not.
+// At Debug, so that nothing is added to the in-memory list, which spdlog does not have.
 void FlushedLine_Zep(benchmark::State& state) {
   TLogger::SetLogThreshold(ILogger::kLogDebug);
   for (auto _ : state) TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogDebug, kMessage);

@@ -1,7 +1,7 @@
-// The DMTF CIM schema, loaded from MOF and copied, beside what each comes down to: a loop that only cuts the text into
-// tokens, and a loop that makes the same calls of the interfaces. The schema is not ours to hand out: ZEP_DMTF_SCHEMA
-// names the folder with its archive, or it lies in shared/data/dmtf-schema beside the source tree. Times are those of the
-// processor: what else the machine does, and the making away with what was made, does not count.
+// Loads the DMTF CIM schema from MOF and copies it. Loading is compared with a loop that only splits the text into tokens,
+// copying with a loop that makes the same calls of the interfaces. The schema may not be distributed with the sources: its
+// archive is taken from the folder ZEP_DMTF_SCHEMA, or from shared/data/dmtf-schema beside the source tree. The times are
+// processor time, without the destruction of the result.
 
 #include "ICIMClass.h"
 #include "ICIMMethodDecl.h"
@@ -47,7 +47,7 @@ fs::path Archive() {
   return {};
 }
 
-// A folder that goes when the program ends.
+// A temporary folder, removed when the program ends.
 class TFolder {
 public:
   TFolder() {
@@ -66,7 +66,7 @@ std::string TextOf(fs::path const& path) {
   return std::string(std::istreambuf_iterator<char>(file), {});
 }
 
-// The schema in its own files; empty when it is not there.
+// The main file of the schema; empty when the schema is missing.
 fs::path const& MainFile() {
   static TFolder const folder;
   static fs::path const file = [] {
@@ -76,7 +76,7 @@ fs::path const& MainFile() {
   return file;
 }
 
-// The same as one text: the qualifiers, and the classes in their order.
+// The schema as two texts: the qualifiers, and the classes in their order.
 struct TSchemaText {
   std::string fQualifiers, fClasses;
 };
@@ -95,8 +95,7 @@ TSchemaText const& SchemaText() {
   return schema;
 }
 
-// So many schemas in one text, the classes of each under names of their own: CIM_ becomes CI1_ and so on, which changes no
-// length.
+// `count` schemas in one text. Each has its own class names, of the same length: CIM_ becomes CI1_ and so on.
 std::string const& Schemas(int count) {
   static std::map<int, std::string> texts;
   std::string& text = texts[count];
@@ -124,7 +123,7 @@ double ProcessorSeconds() {
   return static_cast<double>(time.tv_sec) + static_cast<double>(time.tv_nsec) / 1e9;
 }
 
-// Measures the work; what it returns goes afterwards.
+// Measures the work. Its result is destroyed after the measurement.
 template <class TWork>
 void Measure(benchmark::State& state, TWork const& work) {
   for (auto _ : state) {
@@ -157,7 +156,7 @@ BENCHMARK(Load_Zep)->Unit(benchmark::kMillisecond)->UseManualTime();
 BENCHMARK(Load_Twice)->Unit(benchmark::kMillisecond)->UseManualTime();
 BENCHMARK(Load_FourTimes)->Unit(benchmark::kMillisecond)->UseManualTime();
 
-// The same from its 1,634 files.
+// Loads the schema from its 1,634 files.
 void LoadFiles_Zep(benchmark::State& state) {
   if (IsMissing(state)) return;
   Measure(state, [] {
@@ -173,7 +172,7 @@ bool IsOfName(char c) {
          static_cast<unsigned char>(c) >= 0x80;
 }
 
-// How many tokens the text has, written by hand.
+// The number of tokens in the text, counted by a hand-written loop.
 std::size_t CountTokens(std::string const& text) {
   std::size_t count = 0;
   char const* const end = text.data() + text.size();
@@ -204,7 +203,7 @@ void Load_LoopOverTokens(benchmark::State& state) {
 }
 BENCHMARK(Load_LoopOverTokens)->Unit(benchmark::kMillisecond)->UseManualTime();
 
-// As fast as 40 MB a second.
+// The time that loading would take at 40 MB a second.
 void Load_FortyMegabytesASecond(benchmark::State& state) {
   if (IsMissing(state)) return;
   for (auto _ : state) state.SetIterationTime(static_cast<double>(Schemas(1).size()) / 40e6);
@@ -235,7 +234,7 @@ BENCHMARK(Copy_Zep)->Unit(benchmark::kMillisecond)->UseManualTime();
 BENCHMARK(Copy_Twice)->Unit(benchmark::kMillisecond)->UseManualTime();
 BENCHMARK(Copy_FourTimes)->Unit(benchmark::kMillisecond)->UseManualTime();
 
-// What the copy asks and tells, in one place and without its steps.
+// The calls that a copy makes, in one class and without the copy's own steps.
 class TCopyByHand {
 public:
   explicit TCopyByHand(ICIMNamespace& destination) : fTo(destination) {}
@@ -333,7 +332,7 @@ void Write_Zep(benchmark::State& state) {
 }
 BENCHMARK(Write_Zep)->Unit(benchmark::kMillisecond)->UseManualTime();
 
-// What a loaded schema holds of the heap is its label.
+// The label gives the heap memory that a loaded schema takes.
 void Memory_Zep(benchmark::State& state) {
   if (IsMissing(state)) return;
   std::size_t bytes = 0;

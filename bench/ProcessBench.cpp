@@ -1,5 +1,5 @@
-// Children beside those of GLib, Boost.Process and popen: the start and end of one that prints nothing, also from a parent
-// that holds much memory, and the capture of 10 MB of output.
+// Compares child processes with those of GLib, Boost.Process and popen: running one that prints nothing, also from a parent
+// that holds much memory, and capturing 10 MB of output.
 
 #include "TOSSpecific.h"
 
@@ -33,7 +33,7 @@ std::string CaptureByZep(std::string const& program, std::vector<std::string> co
   return output;
 }
 
-// With descriptors left open for the child, as the others do: GLib starts it by its quickest way then.
+// Leaves descriptors open for the child, as the others do; GLib then uses its fastest way to start it.
 std::string CaptureByGSpawn(std::string const& program, std::vector<std::string> const& arguments) {
   std::vector<char*> texts{const_cast<char*>(program.c_str())};
   for (std::string const& argument : arguments) texts.push_back(const_cast<char*>(argument.c_str()));

@@ -1,5 +1,5 @@
-// Object paths beside hand-written loops over strings, which know neither classes nor types. What a reference asks of its
-// namespace is measured by itself, because the loops have nothing of the kind.
+// Compares object paths with hand-written loops over strings, which know neither classes nor types. The calls that a
+// reference makes to its namespace are measured separately, because the loops have no counterpart.
 
 #include "ICIMClass.h"
 #include "ICIMPropertyDecl.h"
@@ -76,7 +76,8 @@ void Parse_LoopOverStrings(benchmark::State& state) {
 }
 BENCHMARK(Parse_LoopOverStrings);
 
-// What reading asks of the namespace: the class, and of each key its declaration, whether it is a reference, and its type.
+// The calls that reading a path makes to the namespace: for the class, and for each key's declaration, default value and
+// type.
 void Parse_CallsIntoTheNamespace(benchmark::State& state) {
   auto const ns = Namespace();
   std::string const className = "X_Disk";

@@ -1,6 +1,6 @@
-// A file of 1 GiB to a server on loopback and back, beside the curl program with the same libcurl. Of what a download costs
-// more, a part comes from the curl program's larger chunks (100 KiB instead of 16), and a part from the library's write
-// callback, which opens and closes its file for each chunk: the same libcurl with a file that stays open shows the former.
+// Compares transferring a file of 1 GiB to and from a server on loopback with the curl program, which uses the same libcurl.
+// A download is slower for two reasons: the curl program uses larger chunks (100 KiB instead of 16), and the library's write
+// callback opens and closes its file for each chunk. The benchmark with a file that stays open shows the first reason alone.
 
 #include "TOSSpecific.h"
 
@@ -25,7 +25,7 @@ using NQRVZEP20::TOSSpecific;
 
 constexpr std::size_t kSize = std::size_t{1} << 30;
 
-// Files in memory, and a server that shows them: one for the whole run.
+// Files in memory and a server for them, one of each for the complete run.
 class TBed {
 public:
   TBed() {
@@ -102,7 +102,7 @@ std::size_t WriteToStream(void* data, std::size_t size, std::size_t count, void*
   return std::fwrite(data, size, count, static_cast<std::FILE*>(stream));
 }
 
-// As the library does it, but for the file, which stays open.
+// Downloads as the library does, except that the file stays open.
 void DownloadToAnOpenFile(std::string const& url) {
   CURL* const curl = curl_easy_init();
   std::FILE* const stream = std::fopen(Bed().Down().c_str(), "ab");
@@ -145,7 +145,7 @@ TRANSFER(FtpDownload_Zep, "ftp", DownloadByZep);
 TRANSFER(FtpDownload_Curl, "ftp", DownloadByCurl);
 TRANSFER(FtpDownload_OpenFile, "ftp", DownloadToAnOpenFile);
 
-// 1 GiB in the chunks that libcurl hands out.
+// The size of libcurl's chunks; the benchmarks below write 1 GiB in such chunks.
 constexpr std::size_t kChunk = 16384;
 
 void WriteByCallback(benchmark::State& state) {

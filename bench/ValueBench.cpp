@@ -1,5 +1,5 @@
-// Values beside their peers: made and copied beside boost::any, printed beside std::to_chars, Poco and fmt, read beside a
-// standard stream.
+// Compares values with their peers: making and copying with boost::any, printing with std::to_chars, Poco and fmt, reading
+// with a standard stream.
 
 #include "TCIMValue.h"
 
@@ -23,7 +23,7 @@ using TType = TCIMValue::TCIMType;
 
 constexpr int kCount = 1000;
 
-// Numbers of every length, the same in each run.
+// Numbers with any number of digits, the same in each run.
 std::vector<unsigned int> Numbers() {
   std::mt19937 random(1983);
   std::vector<unsigned int> numbers(kCount);
@@ -31,7 +31,7 @@ std::vector<unsigned int> Numbers() {
   return numbers;
 }
 
-// Numbers of the full width, as identifiers and addresses are.
+// Numbers of the full 32 bits, such as identifiers and addresses.
 std::vector<unsigned int> WideNumbers() {
   std::mt19937 random(1983);
   std::vector<unsigned int> numbers(kCount);
@@ -47,7 +47,7 @@ std::vector<double> Reals() {
   return reals;
 }
 
-// Of every magnitude that a double can have.
+// Numbers of nearly every magnitude that a double can have.
 std::vector<double> WideReals() {
   std::mt19937 random(1983);
   std::uniform_real_distribution<double> exponent(-300, 300);
@@ -61,7 +61,7 @@ std::vector<TCIMValue> ValuesOf(std::vector<TNumber> const& numbers) {
   return {numbers.begin(), numbers.end()};
 }
 
-// How many of the thousand are done in a second.
+// Reports the number of items processed in a second.
 void CountItems(benchmark::State& state) { state.SetItemsProcessed(state.iterations() * kCount); }
 
 // ---- Making and copying ----

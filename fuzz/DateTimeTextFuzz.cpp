@@ -1,4 +1,4 @@
-// Reads any text as a datetime: it is refused with kZEPStatusInvalidDateTime, or prints as it was read.
+// Reads any text as a datetime. The text must be refused with kZEPStatusInvalidDateTime, or print as it was read.
 
 #include "TCIMDateTime.h"
 #include "TZEPException.h"
@@ -13,7 +13,7 @@ namespace {
 using NQRVZEP20::TCIMDateTime;
 using NQRVZEP20::TZEPException;
 
-// Sets the datetime, and says whether the text was taken.
+// Sets the datetime and returns whether the text was accepted.
 bool SetOrRefuse(TCIMDateTime& dateTime, std::string const& text) {
   try {
     dateTime.Set(text);
@@ -24,7 +24,8 @@ bool SetOrRefuse(TCIMDateTime& dateTime, std::string const& text) {
   }
 }
 
-// What is printed where reading does not look: the point, what follows the colon, and the sign of no offset.
+// The text as ToString prints it. Printing fixes what reading ignores: the point, the digits after a colon, and the sign of
+// a zero offset.
 std::string AsPrinted(std::string text) {
   text[14] = '.';
   if (text[21] == ':') text.replace(22, 3, "000");
@@ -32,7 +33,7 @@ std::string AsPrinted(std::string text) {
   return text;
 }
 
-// Comparison and arithmetic may refuse, too (an instant that mktime reports as -1), but nothing else.
+// Runs an operation, which may throw kZEPStatusInvalidDateTime (for an instant that mktime reports as -1) but nothing else.
 template <class TOperation>
 void DoOrRefuse(TOperation operation) {
   try {

@@ -1,5 +1,5 @@
-// Any bytes as the options of a DHCP reply. The area lies at the end of a page, with an unreadable page behind it, and what is
-// found must be the value of an option that the area holds whole.
+// Reads any bytes as the options of a DHCP reply. The area is at the end of a page, before an unreadable page, and a value
+// that is found must be that of an option completely inside the area.
 
 #include "AutoProxyDiscovery.h"
 #include "fuzz/Require.h"
@@ -24,7 +24,7 @@ unsigned char* AreaBeforeAnUnreadablePage() {
   return end - kSize;
 }
 
-// Whether an option with that value stands somewhere in the area.
+// Whether the area contains an option 252 with that value.
 bool HasOption(unsigned char const* area, std::string const& value) {
   for (std::size_t at = 0; at + 2 + value.size() <= kSize; ++at)
     if (area[at] == 252 && area[at + 1] == value.size() && std::memcmp(area + at + 2, value.data(), value.size()) == 0)
@@ -37,7 +37,7 @@ bool HasOption(unsigned char const* area, std::string const& value) {
 extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
   static unsigned char* const area = AreaBeforeAnUnreadablePage();
   std::size_t const length = std::min(size, kSize);
-  for (std::size_t const start : {std::size_t{0}, kSize - length}) {  // at the front of the area, and at its end
+  for (std::size_t const start : {std::size_t{0}, kSize - length}) {  // at the start of the area, and at its end
     std::fill_n(area, kSize, static_cast<unsigned char>(0));
     std::copy_n(data, length, area + start);
     std::string const url = AutoProxyDiscovery::dhcp_parser(area);

@@ -1,5 +1,5 @@
-// Reads any bytes as an SMBIOS structure of every type that the host provider knows: each record has its shape, and each
-// property a value or a reason. The same bytes are read as an entry point.
+// Reads any bytes as an SMBIOS structure of every type that the host provider knows. Each record must have its number of
+// properties, and each property a value or a reason. The same bytes are also read as an SMBIOS entry point.
 
 #include "fuzz/Require.h"
 #include "providers/host/SmbiosRecords.h"

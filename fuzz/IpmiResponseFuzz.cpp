@@ -1,5 +1,5 @@
-// Response packets of a management controller, checked in every mode: nothing outside the packet's area may be read, and
-// what is right must be what it is by the layout.
+// Checks any bytes as a response packet of a management controller, in every mode. No byte outside the packet's buffer may
+// be read, and the result must be that of an independent check written here.
 
 #include "IIPMILan.h"
 
@@ -13,8 +13,8 @@ using NQRVZEP20::IIPMILan;
 
 namespace {
 
-// Cuts or fills the packet so that its area has what the header asks for and no byte more: behind the length byte as many
-// bytes as that says, and at least 7.
+// Resizes the packet so that its buffer has exactly the bytes that IIPMILan::ChkResponse requires: after the length byte as
+// many as it says, and at least 7.
 void FitArea(std::vector<char>& packet, std::ptrdiff_t lengthPlace) {
   constexpr std::ptrdiff_t kLeast = 7;
   const std::ptrdiff_t place = std::max<std::ptrdiff_t>(lengthPlace, 0);
@@ -48,7 +48,7 @@ void ExpectSame(bool checked, bool expected) {
 
 extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
   if (size < 6) return 0;
-  // The first byte is the length position, the rest the packet.
+  // The first byte of the input is the length position, the rest is the packet.
   const int lengthPosition = static_cast<signed char>(data[0]);
   std::vector<char> packet(data + 1, data + size);
   const std::ptrdiff_t lengthPlace = lengthPosition - (packet[4] == 0 ? 16 : 0);

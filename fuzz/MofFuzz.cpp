@@ -1,4 +1,4 @@
-// Any text is read as MOF, or refused with a place; and what was read is written as a text that reads back as the same.
+// Reads any text as MOF. The text must be refused with a position, or, once written as MOF, read back as the same.
 
 #include "providers/memory/Mof.h"
 #include "providers/memory/TMemoryNamespace.h"

@@ -1,6 +1,6 @@
-// Any text is read as an object path, or refused in one of the expected ways; and what was read prints as a path that,
-// behind a namespace prefix, is read as an equal one. Paths with references among their keys only print: a reference is
-// printed without the prefix that it needs to be read.
+// Reads any text as an object path. The text must be refused in one of the expected ways, or the path must print as a text
+// that, with a namespace prefix, reads back as an equal path. A path with references among its keys is only printed: a
+// printed reference lacks the prefix that reading it needs.
 
 #include "ILogger.h"
 #include "TCIMReference.h"
@@ -56,6 +56,6 @@ extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size
     EZEPStatusCode const status = failure.GetStatusCode().GetCode();
     if (status != kZEPStatusInvalidReference && status != kZEPStatusInvalidDateTime) std::abort();
   }
-  if (path.GetClass()) RequireThatItReadsBack(ns, path);  // also what was read before a failure
+  if (path.GetClass()) RequireThatItReadsBack(ns, path);  // also a path that was read up to a failure
   return 0;
 }

@@ -2,7 +2,7 @@
 
 #include <cstdlib>
 
-// Ends the fuzz target, which reports the input, when what always holds does not.
+// Aborts the fuzz target, which then reports the input, when a condition that must always hold is false.
 inline void Require(bool isTrue) {
   if (!isTrue) std::abort();
 }

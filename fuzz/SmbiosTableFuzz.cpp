@@ -1,5 +1,5 @@
-// Any bytes as an SMBIOS table: through the parser, through the C functions of libsmbios.so with the bytes as a file in
-// memory, and through what the core makes of the structures. Every structure must be whole and lie in the table.
+// Reads any bytes as an SMBIOS table: with the parser, with the C functions of libsmbios.so on a file in memory, and with
+// the core's readers of structures. Every structure must be complete and inside the table.
 
 #include "TOSSpecific.h"
 #include "fuzz/Require.h"
@@ -22,7 +22,7 @@ using namespace NQRVZEP20;
 
 using TCounts = std::array<int, 256>;  // structures by type
 
-// Each structure is whole and lies right behind the one before.
+// Counts the structures. Each must be complete and directly follow the one before.
 TCounts CountsInTable(std::string_view file) {
   const std::string_view table = smbios::DmiTableIn(file);
   smbios::TStructureReader reader(table);
@@ -55,7 +55,7 @@ void ReadBiosVersion(std::string_view structure) {
   CleanBiosVersion(output.c_str());
 }
 
-// A file in memory under a name that the library can open.
+// A file in memory that the library can open by name.
 class TMemoryFile {
 public:
   TMemoryFile() : fFd(::memfd_create("smbios", 0)) {
@@ -71,7 +71,8 @@ private:
   int fFd;
 };
 
-// Takes all structures of that type through the C functions, and what the core reads out of them.
+// Reads all structures of a type with the C functions, and their texts with the core's readers; returns the number of
+// structures.
 int CountOfType(void* handle, int type) {
   int count = 0;
   char buffer[1024] = {};

@@ -1,5 +1,5 @@
-// Values read from text, of every type. A number must come out as a standard stream in the classic locale reads it (0 where
-// the stream fails), and whatever was read must print, be copied and compare as its type promises.
+// Reads any text as a value of every type. A number must be the one that a standard stream in the classic locale reads (0
+// when the stream fails), and every value must print, copy and compare as its type promises.
 
 #include "TCIMReference.h"
 #include "TCIMValue.h"
@@ -49,7 +49,7 @@ void CompareEachTypeWithStream(std::string& text) {
   CompareWithStream<double>(TType::kCIMTypeReal64, text);
 }
 
-// Its text is its value's: what a stream prints of the number, six digits for a real.
+// The printed text of a real must be the one that a stream prints, with six digits.
 void CompareRealTextWithStream(std::string& text) {
   TCIMValue const value(TType::kCIMTypeReal64, text, nullptr);
   std::ostringstream stream;

@@ -1,1 +1,1 @@
-// A library of nothing.
+// An empty library.

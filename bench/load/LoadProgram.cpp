@@ -1,5 +1,5 @@
-// Loads the library that it is given, with all symbols resolved at once, and prints how many nanoseconds that took. A C++
-// program, as every host is: the C++ library is there already.
+// Loads the library named by its argument, resolving all symbols at once, and prints the time in nanoseconds. It is a C++
+// program, as every host is, so the C++ library is already loaded.
 
 #include <dlfcn.h>
 
