@@ -1,5 +1,5 @@
-# How everything here is compiled: warnings, sanitizers, where the results go, and the functions that make rooms,
-# platform libraries, plug-ins and tests.
+# Settings for everything that is compiled here (warnings, sanitizers, output directories), and the functions that define
+# rooms, platform libraries, plug-ins and tests.
 
 find_package(Boost 1.74 REQUIRED COMPONENTS thread)
 find_package(Threads REQUIRED)
@@ -21,7 +21,7 @@ if(ZEP_TIDY)
   set(CMAKE_CXX_CLANG_TIDY clang-tidy)
 endif()
 
-# The build tree looks like the installed one: what is loaded at run time lies together, test plug-ins elsewhere.
+# The build tree resembles the installed one: libraries loaded at run time share a directory; test plug-ins are elsewhere.
 set(ZEP_LIB_DIR ${PROJECT_BINARY_DIR}/lib)
 set(ZEP_BIN_DIR ${PROJECT_BINARY_DIR}/bin)
 set(ZEP_TEST_DIR ${PROJECT_BINARY_DIR}/tests)
@@ -41,12 +41,12 @@ if(ZEP_SANITIZE)
 endif()
 
 if(ZEP_BUILD_FUZZ)
-  # So that the fuzzer sees which branches of the library an input takes, not only those of the target itself.
+  # Lets the fuzzer see which branches of the library an input takes, not only those of the target itself.
   target_compile_options(zep_options INTERFACE -fsanitize=fuzzer-no-link)
 endif()
 
-# A room of libzepcore.so. It sees the public headers and, as "room/Header.h", the private ones; which rooms it may
-# name there is checked by tests/house.
+# A room of libzepcore.so. It can include the public headers and, as "room/Header.h", the private ones; tests/house checks
+# which rooms' headers it includes.
 function(zep_room name)
   add_library(${name} OBJECT ${ARGN})
   target_link_libraries(${name} PRIVATE zep_options)
@@ -54,8 +54,8 @@ function(zep_room name)
   target_include_directories(${name} PRIVATE ${PROJECT_SOURCE_DIR}/include ${PROJECT_SOURCE_DIR})
 endfunction()
 
-# A library that is loaded at run time and lies beside libzepcore.so under exactly the name given. MAP: the list of what it
-# exports, when that is not all that its sources mark.
+# A library that is loaded at run time. It is placed beside libzepcore.so under exactly the given file name. MAP: a version
+# script that lists the exported symbols, for a library that exports only some of those that its sources mark.
 function(zep_loaded_library name file)
   cmake_parse_arguments(ARG "" "MAP" "" ${ARGN})
   add_library(${name} MODULE ${ARG_UNPARSED_ARGUMENTS})
@@ -68,8 +68,8 @@ function(zep_loaded_library name file)
   endif()
 endfunction()
 
-# A test program of GoogleTest; each of its tests becomes one of ctest's. LIBS are linked, the library always.
-# Tests with the same LOCK never run beside one another.
+# A GoogleTest program; ctest runs each of its tests separately. LIBS are linked in addition to the library. Tests with the
+# same LOCK never run at the same time.
 function(zep_test name)
   cmake_parse_arguments(ARG "" "TIMEOUT;LOCK" "SOURCES;LIBS;LABELS;ENVIRONMENT" ${ARGN})
   if(NOT ARG_TIMEOUT)

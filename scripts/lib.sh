@@ -1,9 +1,9 @@
-# Shared by the scripts here: finding the root, installing packages, building. To be sourced.
+# Functions that the scripts here share: installing packages, building. Source this file; it changes to the root directory.
 
 cd "$(dirname "${BASH_SOURCE[0]}")/.."
 install=yes
 
-# Takes --no-install out of the arguments; the rest is left in `arguments`.
+# Removes --no-install from the arguments and stores the others in `arguments`.
 parse_common_arguments() {
   arguments=()
   for argument in "$@"; do
@@ -11,7 +11,7 @@ parse_common_arguments() {
   done
 }
 
-# Installs the packages of the jobs named, as far as they are missing, and says so.
+# Installs the missing packages of the given jobs and prints their names. With --no-install it only prints them.
 need_packages() {
   local job package missing=()
   for job in "$@"; do
@@ -35,7 +35,7 @@ need_packages() {
   "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive apt-get install -y -qq --no-install-recommends "${missing[@]}" >/dev/null
 }
 
-# Configures and builds a preset: build PRESET [TARGET...]. Without the tests when `with_tests` is OFF, which needs fewer
+# Configures and builds a preset: build PRESET [TARGET...]. With `with_tests` OFF the tests are left out, which needs fewer
 # packages.
 with_tests=ON
 build() {
