@@ -18,7 +18,7 @@ bool NQRVZEP20::CountsAllocations() { return false; }
 
 #else
 
-// Found by the libraries before those of the C++ library.
+// The libraries use these operators instead of those of the C++ library.
 
 ZEP_EXPORT void* operator new(std::size_t size) {
   ++gAllocations;

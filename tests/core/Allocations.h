@@ -2,10 +2,10 @@
 
 namespace NQRVZEP20 {
 
-// Not under the thread sanitizer, which has an operator new of its own that cannot be replaced.
+// Whether allocations are counted. False under the thread sanitizer, whose operator new cannot be replaced.
 bool CountsAllocations();
 
-// How often this program, its libraries included, has called operator new.
+// The number of calls of operator new in this program and its libraries.
 long CountedAllocations();
 
 }  // namespace NQRVZEP20

@@ -16,7 +16,7 @@ namespace {
 
 char const* const kMode = "ZEP_BOOST_ASSERT";
 
-// What a call prints to standard error.
+// The text that a call prints to standard error.
 template <class TFunction>
 std::string Printed(TFunction function) {
   testing::internal::CaptureStderr();
@@ -44,7 +44,7 @@ TEST(AssertionHandlerTest, ThrowsFailInModeThrowzep) {
   EXPECT_EQ(Printed([] { EXPECT_STATUS(boost::assertion_failed("px != 0", "f", "a.cpp", 7), kZEPStatusFail); }), "");
 }
 
-TEST(AssertionHandlerTest, ThrowboostCarriesTheWholeMessage) {
+TEST(AssertionHandlerTest, ThrowboostCarriesTheCompleteMessage) {
   EXPECT_EQ(MessageOf("px != 0", "void f()", "a.cpp", 7), "Boost assertion failure! a.cpp:7 [px != 0] func = void f()");
 }
 
@@ -59,7 +59,7 @@ TEST(AssertionHandlerTest, TheLineNumberIsDecimalInEveryLocale) {
   EXPECT_EQ(message, "Boost assertion failure! a.cpp:1234567 [px != 0] func = f");
 }
 
-TEST(AssertionHandlerTest, ANullPieceDropsTheRestOfTheMessage) {
+TEST(AssertionHandlerTest, ANullArgumentDropsTheRestOfTheMessage) {
   EXPECT_EQ(MessageOf("px != 0", "f", nullptr, 7), "Boost assertion failure! ");
   EXPECT_EQ(MessageOf(nullptr, "f", "a.cpp", 7), "Boost assertion failure! a.cpp:7 [");
   EXPECT_EQ(MessageOf("px != 0", nullptr, "a.cpp", 7), "Boost assertion failure! a.cpp:7 [px != 0] func = ");
@@ -80,13 +80,13 @@ TEST(AssertionHandlerTest, PrintsThroughTheStandardErrorStream) {
   EXPECT_EQ(printed.str(), "\nBoost assertion failure! file.cpp:7 [px != 0] func = f()\n\nForcing segmentation fault.\n");
 }
 
-TEST(AssertionHandlerTest, ExitPrintsAndEndsTheProcessWith1) {
+TEST(AssertionHandlerTest, ExitPrintsAndExitsWithStatus1) {
   TEnvironmentGuard const mode(kMode, "exit");
   EXPECT_EXIT(boost::assertion_failed("px != 0", "f", "a.cpp", 7), testing::ExitedWithCode(1),
               "^\nBoost assertion failure! a.cpp:7 \\[px != 0\\] func = f\n$");
 }
 
-TEST(AssertionHandlerTest, AnyOtherModeComplainsAndThrowsFail) {
+TEST(AssertionHandlerTest, AnyOtherModePrintsAnErrorAndThrowsFail) {
   for (char const* setting : {"THROWZEP", "", " throwzep", "throwzep ", "abort"}) {
     SCOPED_TRACE(setting);
     TEnvironmentGuard const mode(kMode, setting);
@@ -96,7 +96,7 @@ TEST(AssertionHandlerTest, AnyOtherModeComplainsAndThrowsFail) {
   }
 }
 
-TEST(AssertionHandlerTest, TheMessageFormBehavesAlike) {
+TEST(AssertionHandlerTest, TheFormWithAMessageBehavesTheSame) {
   {
     TEnvironmentGuard const mode(kMode, nullptr);
     EXPECT_STATUS(boost::assertion_failed_msg("px != 0", "why", "f", "a.cpp", 7), kZEPStatusFail);
@@ -117,10 +117,10 @@ TEST(AssertionHandlerTest, WritesNothingToTheLog) {
   EXPECT_TRUE(TRootObject::GetCoreLogger()->GetLog().empty());
 }
 
-// Not inline: a compiler that sees that the pointer is empty warns about its use.
+// Not inlined, because a compiler that sees the empty pointer would warn about its use.
 __attribute__((noinline)) boost::shared_ptr<ICIMClass> EmptyPointer() { return boost::shared_ptr<ICIMClass>(); }
 
-TEST(AssertionHandlerTest, AnEmptyPointerOfAPublicHeaderEndsInTheHandler) {
+TEST(AssertionHandlerTest, UsingAnEmptyPointerCallsTheHandler) {
   boost::shared_ptr<ICIMClass> const empty = EmptyPointer();
   {
     TEnvironmentGuard const mode(kMode, nullptr);

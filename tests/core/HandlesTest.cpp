@@ -8,7 +8,7 @@ namespace {
 
 bool IsOpen(int fd) { return ::fcntl(fd, F_GETFD) != -1; }
 
-TEST(TUniqueFdTest, ClosesAtTheEnd) {
+TEST(TUniqueFdTest, ClosesWhenItGoesOutOfScope) {
   int fd;
   {
     TUniqueFd const owner(::open("/dev/null", O_RDONLY));
@@ -19,7 +19,7 @@ TEST(TUniqueFdTest, ClosesAtTheEnd) {
   EXPECT_FALSE(IsOpen(fd));
 }
 
-TEST(TUniqueFdTest, MovingHandsTheDescriptorOver) {
+TEST(TUniqueFdTest, MovingTransfersTheDescriptor) {
   TUniqueFd first(::open("/dev/null", O_RDONLY));
   int const fd = first.get();
   TUniqueFd second(std::move(first));
@@ -32,7 +32,7 @@ TEST(TUniqueFdTest, MovingHandsTheDescriptorOver) {
   EXPECT_EQ(third.get(), fd);
 }
 
-TEST(TUniqueFdTest, ReleaseLetsGoWithoutClosing) {
+TEST(TUniqueFdTest, ReleaseDoesNotClose) {
   TUniqueFd owner(::open("/dev/null", O_RDONLY));
   int const fd = owner.release();
   owner.reset();

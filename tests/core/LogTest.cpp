@@ -18,11 +18,11 @@ namespace {
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-std::optional<ILogger*> gCoreLogger;  // what a test hands out instead of the thread's logger
+std::optional<ILogger*> gCoreLogger;  // returned instead of the thread's logger when set
 
 }  // namespace
 
-// This program's own, which the door uses here.
+// Replaces the library's function in this program.
 ILogger* TRootObject::GetCoreLogger() { return gCoreLogger ? *gCoreLogger : TLogger::GetInstance(); }
 
 namespace {
@@ -55,7 +55,7 @@ protected:
 
 ILogger::EZEPLogSeverity Severity(int value) { return static_cast<ILogger::EZEPLogSeverity>(value); }
 
-TEST_F(LogTest, AnEntryPassesUpToTheThresholdAndAMemoryOnlyOneAlways) {
+TEST_F(LogTest, EntriesUpToTheThresholdAndMemoryOnlyEntriesPass) {
   for (int threshold : {-1, 0, 1, 2, 3, 4, 10, 1000}) {
     for (int severity : {INT_MIN, -1, 0, 1, 2, 3, 4, 5, 10, 99, 100, 101, 102, INT_MAX}) {
       SCOPED_TRACE(testing::Message() << "severity " << severity << ", threshold " << threshold);
@@ -69,7 +69,7 @@ TEST_F(LogTest, AnEntryPassesUpToTheThresholdAndAMemoryOnlyOneAlways) {
   }
 }
 
-TEST_F(LogTest, EveryDoorHasItsSeverity) {
+TEST_F(LogTest, EachFunctionLogsAtItsSeverity) {
   fLogger.fThreshold = ILogger::kLogVerbose;
   LogError("of an error");
   LogStatus("of a status");
@@ -96,7 +96,7 @@ TEST_F(LogTest, NumbersAreDecimal) {
   EXPECT_THAT(fLogger.fEntries, ElementsAre("0 0,-7,255,-9223372036854775808,18446744073709551615,-32768,200"));
 }
 
-TEST_F(LogTest, WithoutALoggerItIsSilent) {
+TEST_F(LogTest, WithoutALoggerNothingIsLogged) {
   gCoreLogger = nullptr;
   EXPECT_FALSE(IsLogged(ILogger::kLogError));
   EXPECT_FALSE(IsLogged(ILogger::kLogMemoryOnly));
@@ -105,7 +105,7 @@ TEST_F(LogTest, WithoutALoggerItIsSilent) {
   EXPECT_THAT(fLogger.fEntries, IsEmpty());
 }
 
-TEST_F(LogTest, AFilteredEntryCostsNoAllocation) {
+TEST_F(LogTest, AFilteredEntryAllocatesNothing) {
   if (!CountsAllocations()) GTEST_SKIP() << "allocations are not counted under the thread sanitizer";
   std::string const longText(1000, 'x');
   long const before = CountedAllocations();
@@ -117,7 +117,7 @@ TEST_F(LogTest, AFilteredEntryCostsNoAllocation) {
   EXPECT_GT(CountedAllocations(), before);
 }
 
-TEST_F(LogTest, TheThreadsLoggerFiltersWithoutAnAllocation) {
+TEST_F(LogTest, TheThreadsLoggerFiltersWithoutAllocating) {
   if (!CountsAllocations()) GTEST_SKIP() << "allocations are not counted under the thread sanitizer";
   gCoreLogger.reset();
   std::string const longText(1000, 'x');
@@ -133,7 +133,7 @@ TEST_F(LogTest, TheThreadsLoggerFiltersWithoutAnAllocation) {
   TLogger::GetInstance()->ClearLog();
 }
 
-TEST_F(LogTest, TheDoorLeadsToTheThreadsLogger) {
+TEST_F(LogTest, EntriesGoToTheThreadsLogger) {
   gCoreLogger.reset();
   OnNewThread([] {
     TLogCapture const log;

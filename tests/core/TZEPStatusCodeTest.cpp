@@ -63,7 +63,7 @@ TRow const kAllCodes[] = {
     {43, fdrStatusEnd, "fdrStatusEnd"},
 };
 
-TEST(TZEPStatusCodeTest, EveryCodeHasItsNumberAndItsNameForText) {
+TEST(TZEPStatusCodeTest, EveryCodeHasItsNumberAndItsNameAsText) {
   int expected = 0;
   for (TRow const& row : kAllCodes) {
     SCOPED_TRACE(row.name);
@@ -75,7 +75,7 @@ TEST(TZEPStatusCodeTest, EveryCodeHasItsNumberAndItsNameForText) {
   EXPECT_EQ(expected, 44);
 }
 
-TEST(TZEPStatusCodeTest, IsMadeFromAnEnumeratorAndComparesWithOne) {
+TEST(TZEPStatusCodeTest, ConvertsFromAnEnumeratorAndComparesWithOne) {
   TZEPStatusCode const code = kZEPStatusNotFound;
   EXPECT_TRUE(code == kZEPStatusNotFound);
   EXPECT_TRUE(kZEPStatusNotFound == code);
@@ -85,16 +85,16 @@ TEST(TZEPStatusCodeTest, IsMadeFromAnEnumeratorAndComparesWithOne) {
   static_assert(sizeof(TZEPStatusCode) == 4 && std::is_signed_v<std::underlying_type_t<EZEPStatusCode>>);
 }
 
-TEST(TZEPStatusCodeTest, IsMadeFromANumberAsWell) {
+TEST(TZEPStatusCodeTest, ConvertsFromANumber) {
   EXPECT_EQ(TZEPStatusCode(15), kZEPStatusNotFound);
   EXPECT_STREQ(TZEPException(15).what(), "kZEPStatusNotFound");
 }
 
-TEST(TZEPStatusCodeTest, TextIsTheSameObjectAtEachCall) {
+TEST(TZEPStatusCodeTest, TextIsTheSameObjectOnEachCall) {
   EXPECT_EQ(&TZEPStatusCode(kZEPStatusFail).TranslateStatusCode(), &TZEPStatusCode(kZEPStatusFail).TranslateStatusCode());
 }
 
-TEST(TZEPExceptionTest, IsMadeFromEitherAndCopiesItsCode) {
+TEST(TZEPExceptionTest, ConvertsFromAnEnumeratorOrAStatusCodeAndCopies) {
   TZEPException const fromEnumerator(kZEPStatusTypeMismatch);
   TZEPException const fromCode{TZEPStatusCode(kZEPStatusTypeMismatch)};
   TZEPException const copy(fromCode);

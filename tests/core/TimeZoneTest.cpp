@@ -7,7 +7,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-TEST(TimeZoneTest, TellsEachChangeOnce) {
+TEST(TimeZoneTest, EachChangeIsReportedOnce) {
   TEnvironmentGuard const guard("TZ", nullptr);
   TTimeZone zone;
   EXPECT_TRUE(zone.HasChanged()) << "the first time, also without a TZ";
@@ -21,7 +21,7 @@ TEST(TimeZoneTest, TellsEachChangeOnce) {
   }
 }
 
-TEST(TimeZoneTest, ATextThatIsTooLongCountsAsChangedEachTime) {
+TEST(TimeZoneTest, ATooLongTextIsReportedAsChangedEachTime) {
   TEnvironmentGuard const guard("TZ", std::string(64, 'x').c_str());
   TTimeZone zone;
   EXPECT_TRUE(zone.HasChanged());
@@ -31,7 +31,7 @@ TEST(TimeZoneTest, ATextThatIsTooLongCountsAsChangedEachTime) {
   EXPECT_FALSE(zone.HasChanged());
 }
 
-TEST(TimeZoneTest, EachHasAMemoryOfItsOwn) {
+TEST(TimeZoneTest, EachObjectReportsAChangeByItself) {
   TEnvironmentGuard const guard("TZ", "UTC0");
   TTimeZone one, another;
   EXPECT_TRUE(one.HasChanged());

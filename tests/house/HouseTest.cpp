@@ -1,4 +1,4 @@
-// The rules of the house: which room may name which, and what libzepcore.so shows of itself.
+// Rules for the complete source tree: which room may include which, and what libzepcore.so exports.
 
 #include "tests/Support.h"
 
@@ -59,7 +59,8 @@ std::vector<std::string> QuotedIncludesOf(fs::path const& source) {
   return names;
 }
 
-// The room that an include names: beside the source, from the root ("core/Log.h"), or one of the flat public folders.
+// The room of an included file, which is given relative to the source, relative to the root ("core/Log.h"), or by its name
+// in one of the flat public folders.
 std::string RoomNamedBy(std::string const& include, fs::path const& source) {
   if (fs::exists(kSource / include)) return fs::path(include).parent_path().string();
   if (fs::exists(source.parent_path() / include)) return fs::relative(source.parent_path(), kSource).string();
@@ -68,7 +69,7 @@ std::string RoomNamedBy(std::string const& include, fs::path const& source) {
   return "nowhere";
 }
 
-TEST(HouseTest, RoomsNameOnlyTheRoomsTheyMay) {
+TEST(HouseTest, RoomsIncludeOnlyTheRoomsTheyMay) {
   int checked = 0;
   for (TRoom const& room : kRooms) {
     std::set<std::string> allowed(room.mayName.begin(), room.mayName.end());
@@ -83,7 +84,7 @@ TEST(HouseTest, RoomsNameOnlyTheRoomsTheyMay) {
   EXPECT_GT(checked, 100);
 }
 
-TEST(HouseTest, EveryPublicHeaderIsInTheOneThatIncludesThemAll) {
+TEST(HouseTest, ZepcoreHeaderIncludesEveryPublicHeader) {
   std::set<std::string> const all = [] {
     auto const names = QuotedIncludesOf(kSource / "include/zepcore.h");
     return std::set<std::string>(names.begin(), names.end());
@@ -94,7 +95,7 @@ TEST(HouseTest, EveryPublicHeaderIsInTheOneThatIncludesThemAll) {
   }
 }
 
-// Every test of the tree, as "Suite.Name".
+// The names of all tests in the tree, as "Suite.Name".
 std::set<std::string> AllTests() {
   static std::regex const test(R"(^(?:TYPED_)?TEST(?:_F|_P)?\((\w+), (\w+)\))");
   std::set<std::string> tests;
@@ -131,7 +132,7 @@ std::string OutputOf(std::string const& command) {
   return output;
 }
 
-// The names of the library's dynamic symbol table that it defines itself.
+// The symbols that the library itself defines in its dynamic symbol table.
 std::vector<std::string> ExportedSymbols() {
   std::vector<std::string> symbols;
   std::istringstream lines(OutputOf("nm -D -C --defined-only " ZEP_LIBRARY));
@@ -147,12 +148,12 @@ TEST(HouseTest, OnlyPublicSymbolsAreExported) {
   std::vector<std::string> const symbols = ExportedSymbols();
   EXPECT_GT(symbols.size(), 100u);
   for (std::string const& symbol : symbols) {
-    if (symbol.rfind("__", 0) == 0) continue;  // of a sanitizer's run time
+    if (symbol.rfind("__", 0) == 0) continue;  // belongs to a sanitizer
     EXPECT_TRUE(std::regex_search(symbol, isPublic)) << symbol;
   }
 }
 
-TEST(HouseTest, WhatIsThrownAndCastAcrossLibrariesIsExported) {
+TEST(HouseTest, TypesThrownAndCastAcrossLibrariesAreExported) {
   std::vector<std::string> const list = ExportedSymbols();
   std::set<std::string> const symbols(list.begin(), list.end());
   for (char const* name : {"TZEPException", "TBoostAssertException", "ICIMClass", "ICIMInstance", "ICIMNamespace", "ILogger",

@@ -55,12 +55,12 @@ TEST(GenSumTest, BytesAndChecksumAddUpToZero) {
 
 // ---- ChkResponse ----
 
-// Where the length byte lies with an authentication code: RMCP header 4, session header 9, code 16.
+// The offset of the length byte in a packet with an authentication code: RMCP header 4, session header 9, code 16.
 constexpr int kLengthPosition = 29;
 
 enum class EAuthentication { kNone = 0, kMD5 = 2 };
 
-// A whole response packet with the message given up to its data; the checksums are right.
+// A complete response packet with correct checksums.
 std::string Packet(EAuthentication authentication, int completionCode, std::string const& data) {
   std::string packet = "\x06\0\xFF\x07"s;  // RMCP
   packet += static_cast<char>(authentication);
@@ -76,18 +76,18 @@ std::string Packet(EAuthentication authentication, int completionCode, std::stri
   return packet + message;
 }
 
-// The packet in an area of exactly its size, so that a read outside of it is seen by the sanitizers.
+// Checks the packet in a buffer of exactly its size, so that the sanitizers detect a read outside it.
 bool Check(IIPMILan& link, std::string const& packet, int lengthPosition, int mode) {
   std::vector<char> area(packet.begin(), packet.end());
   area.shrink_to_fit();
   return link.ChkResponse(area.data(), lengthPosition, mode);
 }
 
-TEST(ChkResponseTest, EachModeTestsItsPart) {
+TEST(ChkResponseTest, EachModeMakesItsOwnTests) {
   struct TRow {
     bool isChecksumRight;
     int completionCode;
-    bool results[5];  // of the modes 0, 1, 2, 3 and -1
+    bool results[5];  // for the modes 0, 1, 2, 3 and -1
   };
   TRow const rows[] = {
       {true, 0, {true, true, true, true, true}},
@@ -126,7 +126,7 @@ TEST(ChkResponseTest, AuthenticationType0ReadsTheLength16PlacesEarlier) {
   IIPMILan& link = *IIPMILan::Initialize();
   std::string packet = Packet(EAuthentication::kMD5, 0, "abc");
   EXPECT_TRUE(Check(link, packet, kLengthPosition, 0));
-  packet[4] = 0;  // now the length is at byte 13, and says 90
+  packet[4] = 0;  // the length is now byte 13, and is 90
   EXPECT_FALSE(Check(link, packet + std::string(100, '\0'), kLengthPosition, 0));
   EXPECT_TRUE(Check(link, packet, kLengthPosition + 16, 0));
   for (int type : {1, 2, 4, 5, 6, 255}) {
@@ -135,7 +135,7 @@ TEST(ChkResponseTest, AuthenticationType0ReadsTheLength16PlacesEarlier) {
   }
 }
 
-TEST(ChkResponseTest, EveryChangedByteOfTheMessageIsSeen) {
+TEST(ChkResponseTest, EveryChangedByteOfTheMessageIsDetected) {
   IIPMILan& link = *IIPMILan::Initialize();
   std::string const good = Packet(EAuthentication::kNone, 0, "some data");
   for (std::size_t place = 14; place < good.size(); ++place) {
@@ -145,11 +145,11 @@ TEST(ChkResponseTest, EveryChangedByteOfTheMessageIsSeen) {
   }
 }
 
-// The message length is a signed byte: what it says leads to places in front of the message, and of the packet.
-TEST(ChkResponseTest, ALengthThatRunsBackwardsIsComparedWithTheByteThere) {
+// The message length is a signed byte. A negative length leads to bytes before the message and before the packet.
+TEST(ChkResponseTest, ANegativeLengthIsComparedWithAnEarlierByte) {
   struct TRow {
     int length;
-    int place;  // of the byte that the empty sum, 0, is compared with; below 0: in front of the packet
+    int place;  // offset of the byte that is compared with 0, the empty sum; negative: before the packet
   };
   TRow const rows[] = {{0, 13}, {-1, 12}, {-2, 11}, {-13, 0}, {-14, -1}, {-15, -2}, {-128, -115}};
   for (TRow const& row : rows) {
@@ -174,8 +174,8 @@ TEST(ChkResponseTest, AMessageOfOneByteIsItsOwnChecksum) {
   }
 }
 
-TEST(ChkResponseTest, ALengthPositionInFrontOfThePacketFailsTheTestThatNeedsIt) {
-  std::string packet(16, '\0');  // authentication type 0, completion code 0 wherever it is
+TEST(ChkResponseTest, ALengthPositionBeforeThePacketFailsTheTestThatNeedsIt) {
+  std::string packet(16, '\0');  // authentication type 0, and completion code 0 at any offset
   for (int position : {15, 8, 0, -1, -1000, -2147483647 - 1}) {
     SCOPED_TRACE(position);
     IIPMILan& link = *IIPMILan::Initialize();
@@ -186,7 +186,7 @@ TEST(ChkResponseTest, ALengthPositionInFrontOfThePacketFailsTheTestThatNeedsIt) 
   }
 }
 
-// Pages that may not be touched lie in front of and behind a page that may.
+// A page between two pages that cannot be accessed.
 class TGuardedPage {
 public:
   TGuardedPage() : fPages(static_cast<char*>(::mmap(nullptr, 3 * kSize, PROT_NONE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0))) {
@@ -206,9 +206,9 @@ private:
   char* const fPages;
 };
 
-// Whatever the length byte says, the check reads nothing outside the area that the header asks for: that would end the
-// test, and give other results in other places.
-TEST(ChkResponseTest, EveryLengthStaysWithinTheArea) {
+// For any length byte, the check reads nothing outside the buffer that the header requires. A read outside it would crash
+// the test, or give different results at the two ends of the page.
+TEST(ChkResponseTest, NoLengthMakesTheCheckReadOutsideTheBuffer) {
   TGuardedPage const page;
   IIPMILan& link = *IIPMILan::Initialize();
   for (int length = -128; length <= 127; ++length)
@@ -222,7 +222,7 @@ TEST(ChkResponseTest, EveryLengthStaysWithinTheArea) {
     }
 }
 
-TEST(ChkResponseTest, AModeReadsOnlyWhatItTests) {
+TEST(ChkResponseTest, AModeReadsOnlyTheBytesThatItTests) {
   IIPMILan& link = *IIPMILan::Initialize();
   std::string const whole = Packet(EAuthentication::kNone, 0, "");
   EXPECT_TRUE(Check(link, whole.substr(0, 21), kLengthPosition, 2)) << "no checksum is there";

@@ -1,4 +1,4 @@
-// The link to the management controller, with stand-ins for its platform libraries.
+// Tests the link to the management controller with stand-ins for its platform libraries.
 
 #include "IIPMILan.h"
 
@@ -17,7 +17,7 @@ namespace {
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-// The first test of the program, so that nothing made a link before.
+// The first test of the program, because any other test may create a link.
 TEST(NoIPMILanTest, ThereIsNoLinkBeforeInitialize) {
   EXPECT_EQ(IIPMILan::GetInstance(), nullptr);
   EXPECT_EQ(TRootObject::GetipmiLanIns(), nullptr);
@@ -37,7 +37,7 @@ protected:
   }
   bool IsUsbLanLoaded() { return ::dlopen(dir_.Path("ovdusblan.so").c_str(), RTLD_LAZY | RTLD_NOLOAD) != nullptr; }
 
-  // A response whose check makes the link's status true.
+  // Checks a valid response, which makes the link's status true.
   void GetAResponse() {
     char packet[32] = {};
     ASSERT_TRUE(link_->ChkResponse(packet, 29, 1));
@@ -121,7 +121,7 @@ TEST_F(IIPMILanTest, AnIndexAbove15IsLoggedAndChangesNothing) {
   EXPECT_EQ(link_->getCurrentUser(), "zepadmin");
 }
 
-TEST_F(IIPMILanTest, TheGlobalAccountIsThatOfTheOpenSession) {
+TEST_F(IIPMILanTest, TheGlobalAccountIsThatOfTheSession) {
   link_->setAccount(2, "user2", "password2");
   link_->IpmiInBandLanConnect(2, "p");
   link_->IpmilanOpenConnect("bmc.example", "zepadmin", "secret");
@@ -145,7 +145,7 @@ TEST_F(IIPMILanTest, OpeningLogsThePasswordAndRemembersTheParameters) {
   EXPECT_FALSE(link_->getipmiLanStatus()) << "only a response makes it true";
 }
 
-TEST_F(IIPMILanTest, TheParametersAreStoredBehindTheCall) {
+TEST_F(IIPMILanTest, TheParametersAreStoredAfterTheCall) {
   std::vector<std::string> before;
   link_->IpmilanOpenConnect("earlier", "one", "two");
   standIn_.atOpen = [&] { before = SessionParameters(); };
@@ -156,7 +156,7 @@ TEST_F(IIPMILanTest, TheParametersAreStoredBehindTheCall) {
   EXPECT_THAT(SessionParameters(), ElementsAre("later", "623", "three", "four"));
 }
 
-TEST_F(IIPMILanTest, AFailureToOpenIsLoggedWithTheCodeAndRemembersTheParametersAsWell) {
+TEST_F(IIPMILanTest, AFailureToOpenIsLoggedWithTheCodeAndRemembersTheParameters) {
   for (int code : {1, -1, 255, 2147483647}) {
     SCOPED_TRACE(code);
     standIn_.openResult = code;
@@ -183,7 +183,7 @@ TEST_F(IIPMILanTest, ClosingForgetsTheSession) {
   EXPECT_EQ(::fcntl(socket, F_GETFD), -1) << "the socket should be closed";
 }
 
-TEST_F(IIPMILanTest, ClosingWithoutASessionCallsTheLibraryAllTheSame) {
+TEST_F(IIPMILanTest, ClosingWithoutASessionStillCallsTheLibrary) {
   EXPECT_THAT(
       LogOf([&] { link_->IpmilanCloseConnect(); }),
       ElementsAre("[Debug] Enter IpmilanCloseConnect", "[Debug] > CloseConnection()", "[Debug] Exit IpmilanCloseConnect"));
@@ -216,7 +216,7 @@ TEST_F(IIPMILanTest, InBandBringsTheUsbLanUpFirst) {
   EXPECT_EQ(LogOf([&] { EXPECT_TRUE(link_->IpmiInBandLanConnect(0, "libFan")); }), expected);
 }
 
-TEST_F(IIPMILanTest, InBandTellsThatItFailed) {
+TEST_F(IIPMILanTest, InBandLogsAndReturnsItsFailure) {
   standIn_.openResult = 4;
   EXPECT_THAT(LogOf([&] { EXPECT_FALSE(link_->IpmiInBandLanConnect(1, "libFan")); }),
               ElementsAre("[Debug] Enter IpmilanOpenConnect", "[Debug] host: 169.254.96.118",
@@ -226,7 +226,7 @@ TEST_F(IIPMILanTest, InBandTellsThatItFailed) {
   EXPECT_EQ(link_->getCurrentHost(), "169.254.96.118") << "the node is the current one all the same";
 }
 
-TEST_F(IIPMILanTest, AnIntegerThrownOnTheWayIsLoggedWithoutTheFirstLetter) {
+TEST_F(IIPMILanTest, AThrownIntegerIsLoggedWithoutTheFirstLetter) {
   standIn_.thrownByOpen = -5;
   std::vector<std::string> const log = LogOf([&] { EXPECT_FALSE(link_->IpmiInBandLanConnect(0, "libFan")); });
   ASSERT_FALSE(log.empty());
@@ -296,7 +296,7 @@ TEST_F(IIPMILanTest, WithoutTheUsbLanLibraryOrOneOfItsFunctionsNothingIsBroughtU
   }
 }
 
-TEST_F(IIPMILanTest, AUsbLanLibraryThatLacksWhatItDoesNotCallIsUsed) {
+TEST_F(IIPMILanTest, AUsbLanLibraryWithAnUnresolvedSymbolIsUsed) {
   UseUsbLan("unresolved", "0");
   EXPECT_EQ(::dlopen("./ovdusblan.so", RTLD_NOW), nullptr) << "there should be something that is lacking";
   EXPECT_TRUE(link_->bringupOvdLan());
@@ -309,7 +309,7 @@ TEST_F(IIPMILanTest, TheUsbLanLibraryIsTheOneInTheWorkingDirectory) {
   EXPECT_FALSE(link_->bringupOvdLan());
 }
 
-TEST_F(IIPMILanTest, AnExceptionOutOfTheUsbLanLibraryIsLogged) {
+TEST_F(IIPMILanTest, AnExceptionThrownByTheUsbLanLibraryIsLogged) {
   UseUsbLan("whole", "1");
   for (char const* thrown : {"GetNodes int", "GetNodes text", "QueryOvdLanState int", "BringupOvdLan text"}) {
     SCOPED_TRACE(thrown);
@@ -323,7 +323,7 @@ TEST_F(IIPMILanTest, AnExceptionOutOfTheUsbLanLibraryIsLogged) {
   EXPECT_TRUE(link_->IpmiInBandLanConnect(0, "p")) << "the session is opened all the same";
 }
 
-// ---- What a caller needs that speaks the protocol itself ----
+// ---- For callers that speak the protocol themselves ----
 
 TEST_F(IIPMILanTest, TheStatusIsLogged) {
   EXPECT_THAT(LogOf([&] { EXPECT_FALSE(link_->getipmiLanStatus()); }), ElementsAre("[Debug] getipmiLanStatus = 0"));
@@ -355,7 +355,7 @@ TEST_F(IIPMILanTest, TheSessionIdentifierIsCopiedUpTo19Bytes) {
   }
 }
 
-TEST_F(IIPMILanTest, PasswordAndAddressAreCopiedWholeWhateverTheSize) {
+TEST_F(IIPMILanTest, PasswordAndAddressAreCopiedCompletelyForAnySize) {
   link_->m_password.fill('p');
   link_->m_address.fill('a');
   for (int size : {20, 40, 0, 1, -1}) {
@@ -367,7 +367,7 @@ TEST_F(IIPMILanTest, PasswordAndAddressAreCopiedWholeWhateverTheSize) {
   }
 }
 
-TEST_F(IIPMILanTest, SocketAndServerAddressAreHandedOut) {
+TEST_F(IIPMILanTest, SocketAndServerAddressAreReturned) {
   EXPECT_EQ(link_->getTheSocket(), -1);
   EXPECT_TRUE(link_->closeSocket()) << "also without one";
   link_->m_saServer.sin_port = 623;
@@ -379,7 +379,7 @@ TEST_F(IIPMILanTest, SocketAndServerAddressAreHandedOut) {
   EXPECT_EQ(link_->getTheSocket(), socket);
   EXPECT_TRUE(link_->closeSocket());
   EXPECT_EQ(::fcntl(socket, F_GETFD), -1);
-  int const another = ::dup(0);  // most likely under the same number
+  int const another = ::dup(0);  // most likely gets the same number
   EXPECT_TRUE(link_->closeSocket());
   EXPECT_GE(::fcntl(another, F_GETFD), 0) << "what was closed is not closed again";
   ::close(another);
@@ -387,7 +387,7 @@ TEST_F(IIPMILanTest, SocketAndServerAddressAreHandedOut) {
 
 // ---- Without the platform library ----
 
-TEST(IncompleteIpmiClientTest, ALibraryWithoutAFunctionCannotDoThat) {
+TEST(IncompleteIpmiClientTest, AMissingFunctionGivesNotFoundAndTheOthersAreUsed) {
   LoadStandInIpmiClient("without-open");
   IIPMILan& link = *IIPMILan::Initialize();
   std::vector<std::string> const log = LogOf([&] { EXPECT_FALSE(link.IpmilanOpenConnect("h", "u", "p")); });
@@ -397,7 +397,7 @@ TEST(IncompleteIpmiClientTest, ALibraryWithoutAFunctionCannotDoThat) {
   EXPECT_THAT(LogOf([&] { link.IpmilanCloseConnect(); }), testing::Contains("[Debug] > CloseConnection()"));
 }
 
-TEST(IncompleteIpmiClientTest, ClosingNeedsNoCloseConnection) {
+TEST(IncompleteIpmiClientTest, ClosingWorksWithoutCloseConnection) {
   LoadStandInIpmiClient("without-close");
   IIPMILan& link = *IIPMILan::Initialize();
   EXPECT_TRUE(link.IpmilanOpenConnect("h", "u", "p"));

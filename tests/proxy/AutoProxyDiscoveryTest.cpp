@@ -1,4 +1,4 @@
-// The steps of the discovery, each on its own. What touches a network does so on a thread in an empty network of its own.
+// Tests each step of the discovery separately. A step that uses a network runs on a thread in an empty network namespace.
 // The steps that end processes, wpadPreconfig and StartWpad, are tested in tests/system/wpad only.
 
 #include "AutoProxyDiscovery.h"
@@ -23,14 +23,14 @@
 
 namespace {
 
-int gPauses = -1;  // -1: sleep sleeps
+int gPauses = -1;  // the pauses counted so far; -1: sleep really sleeps
 unsigned gPauseSeconds = 0;
 int gPausesUntilPortIsFree = 0;
 int gPortHolder = -1;
 
 }  // namespace
 
-// Found by the library before that of the C library: a test counts the pauses instead of waiting.
+// The library calls this function instead of that of the C library, so that a test counts pauses instead of waiting.
 extern "C" ZEP_EXPORT unsigned sleep(unsigned seconds) {
   if (gPauses < 0) {
     timespec const time{static_cast<time_t>(seconds), 0};
@@ -51,7 +51,7 @@ struct TFree {
 };
 using TMessage = std::unique_ptr<unsigned char, TFree>;
 
-// What the step logged, on a thread of its own.
+// Runs the step on a thread of its own and returns the lines that it logged.
 TEntries LogOf(std::function<void()> const& step) {
   TEntries entries;
   OnNewThread([&] {
@@ -80,12 +80,12 @@ TEST(AutoProxyDiscoveryTest, AllocatesZeroFilledMemory) {
   }
 }
 
-TEST(AutoProxyDiscoveryTest, ThereMayBeNoMemory) {
+TEST(AutoProxyDiscoveryTest, WithoutMemoryXzallocReturnsNull) {
   if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, whose allocator ends the program";
   EXPECT_EQ(AutoProxyDiscovery::xzalloc(1ul << 62), nullptr);
 }
 
-TEST(AutoProxyDiscoveryTest, MessageIsThatOfTheTable) {
+TEST(AutoProxyDiscoveryTest, MessageHasItsFixedBytes) {
   std::string expected(1472, '\0');
   expected.replace(0, 8, std::string("\x01\x01\x06\x00\xbf\x07\x00\x00", 8));
   expected.replace(12, 4, "\x0a\x4d\x01\x02");
@@ -106,7 +106,7 @@ TEST(AutoProxyDiscoveryTest, MessageIsThatOfTheTable) {
   EXPECT_EQ(std::string(third.get(), third.get() + 1472), expected);
 }
 
-TEST(AutoProxyDiscoveryTest, WhatCannotBeReadStaysZeroInTheMessage) {
+TEST(AutoProxyDiscoveryTest, MalformedAddressesAreZeroInTheMessage) {
   TMessage message;
   EXPECT_EQ(LogOf([&] { message.reset(AutoProxyDiscovery::make_message("10.77", "02:ab")); }),
             (TEntries{"[Debug] IP v4 Format!", "[Debug] invalid IP Format : 10.77", "[Debug] invalid MAC Format!"}));
@@ -149,7 +149,7 @@ TEST(AutoProxyDiscoveryTest, ReadsIPV4Addresses) {
   }
 }
 
-TEST(AutoProxyDiscoveryTest, AnIPV6AddressIsNoneUnlessItHoldsOneOfIPV4) {
+TEST(AutoProxyDiscoveryTest, AnIPV6AddressGivesZeroUnlessItIsAMappedIPV4Address) {
   struct {
     std::string text;
     std::uint32_t address;
@@ -180,7 +180,7 @@ TEST(AutoProxyDiscoveryTest, AnIPV6AddressIsNoneUnlessItHoldsOneOfIPV4) {
   }
 }
 
-TEST(AutoProxyDiscoveryTest, TheFormOfAnAddressTellsWhichItIs) {
+TEST(AutoProxyDiscoveryTest, AnAddressWithAColonIsReadAsIPV6) {
   struct {
     std::string text;
     std::uint32_t address;
@@ -205,7 +205,7 @@ TEST(AutoProxyDiscoveryTest, ReadsHardwareAddresses) {
   std::array<unsigned char, 8> const untouched = {9, 9, 9, 9, 9, 9, 9, 9};
   struct {
     std::string text;
-    std::array<unsigned char, 8> bytes;  // two more than there are
+    std::array<unsigned char, 8> bytes;  // two more than an address has
   } const rows[] = {
       {"00:11:22:33:44:55", {0x00, 0x11, 0x22, 0x33, 0x44, 0x55, 9, 9}},
       {"09:af:AF:f0:0F:ff", {0x09, 0xaf, 0xaf, 0xf0, 0x0f, 0xff, 9, 9}},
@@ -234,7 +234,7 @@ TEST(AutoProxyDiscoveryTest, ReadsHardwareAddresses) {
 
 // ---- Sockets ----
 
-// No descriptor is left for a new one while it lives.
+// While an object exists, no new descriptor can be opened.
 class TNoMoreDescriptors {
 public:
   TNoMoreDescriptors() {
@@ -248,7 +248,7 @@ private:
   rlimit fOld;
 };
 
-TEST(AutoProxyDiscoveryTest, TheSendSocketIsOneOfUdpThatMayBroadcast) {
+TEST(AutoProxyDiscoveryTest, TheSendSocketIsAUdpSocketThatMayBroadcast) {
   int socket = -1;
   EXPECT_EQ(LogOf([&] { socket = AutoProxyDiscovery::open_send_socket(); }), TEntries{});
   ASSERT_GE(socket, 0);
@@ -261,7 +261,7 @@ TEST(AutoProxyDiscoveryTest, TheSendSocketIsOneOfUdpThatMayBroadcast) {
   ::close(socket);
 }
 
-TEST(AutoProxyDiscoveryTest, ThereMayBeNoSockets) {
+TEST(AutoProxyDiscoveryTest, WithoutDescriptorsOpeningASocketFailsWithALogLine) {
   if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs descriptors of its own";
   int sender = 0, receiver = 0;
   EXPECT_EQ(LogOf([&] {
@@ -274,7 +274,7 @@ TEST(AutoProxyDiscoveryTest, ThereMayBeNoSockets) {
   EXPECT_EQ(receiver, -1);
 }
 
-TEST(AutoProxyDiscoveryTest, TheTimeoutIsThatOfReceiving) {
+TEST(AutoProxyDiscoveryTest, TheTimeoutAppliesToReceiving) {
   int const socket = ::socket(AF_INET, SOCK_DGRAM, 0);
   EXPECT_EQ(AutoProxyDiscovery::readable_timeo(socket, 6), 0);
   timeval limit{};
@@ -295,7 +295,7 @@ TEST(AutoProxyDiscoveryTest, TheTimeoutIsThatOfReceiving) {
   EXPECT_EQ(AutoProxyDiscovery::readable_timeo(socket, 6), -1);
 }
 
-// Runs the test in a network that has nothing but a loopback interface.
+// Runs the test in a network namespace that has only a loopback interface.
 void InOwnNetwork(std::function<void()> const& test) {
   OnNewThread([&] {
     if (::unshare(CLONE_NEWNET) != 0) FAIL() << "no network of its own: " << std::strerror(errno);
@@ -324,7 +324,7 @@ protected:
   void SetUp() override { NEEDS(::geteuid() == 0, "only root makes a network"); }
   ~PortTest() override { gPauses = -1; }
 
-  // Opens the receiving socket with its pauses counted instead of waited for.
+  // Opens the receiving socket while port 68 is taken, and counts its pauses instead of waiting.
   static int OpenCountingPauses(int pausesUntilPortIsFree) {
     gPortHolder = SocketAt(68);
     gPauses = 0, gPauseSeconds = 0, gPausesUntilPortIsFree = pausesUntilPortIsFree;
@@ -383,14 +383,14 @@ TEST_F(PortTest, ARetryWaitsThreeSeconds) {
     int const socket = AutoProxyDiscovery::open_recv_socket(nullptr);
     std::chrono::duration<double> const waited = std::chrono::steady_clock::now() - start;
     EXPECT_GE(waited.count(), 2.9);
-    EXPECT_LT(waited.count(), 5.9);  // two pauses are 6
+    EXPECT_LT(waited.count(), 5.9);  // two pauses take 6 seconds
     EXPECT_EQ(ntohs(NameOf(socket).sin_port), 68);
     release.join();
     ::close(socket);
   });
 }
 
-TEST_F(PortTest, APacketGoesToEveryoneAtPort67) {
+TEST_F(PortTest, APacketIsBroadcastToPort67) {
   NEEDS(std::system("command -v ip > /dev/null") == 0, "no ip (package iproute2)");
   InOwnNetwork([] {
     ASSERT_EQ(std::system("ip link set lo up && ip route add 255.255.255.255 dev lo"), 0);
@@ -419,7 +419,7 @@ TEST_F(PortTest, APacketGoesToEveryoneAtPort67) {
   });
 }
 
-TEST_F(PortTest, APacketThatCannotBeSentIsTold) {
+TEST_F(PortTest, AFailureToSendIsReturned) {
   InOwnNetwork([] {
     unsigned char const byte = 1;
     int const sender = AutoProxyDiscovery::open_send_socket();

@@ -1,4 +1,4 @@
-// The options of a DHCP reply, which come from whoever sends to the port.
+// Parsing the options of a DHCP reply, which anyone can send to the port.
 
 #include "tests/proxy/Replies.h"
 
@@ -19,7 +19,7 @@ protected:
   TOptionsArea area_;
 };
 
-// Options that fill the area up to that offset: as few as possible, each of code 1.
+// As few options as possible, each of code 1, that fill the area up to that offset.
 TBytes FilledTo(std::size_t offset) {
   TBytes options;
   while (options.size() < offset) {
@@ -74,9 +74,9 @@ TEST_F(DhcpParserTest, FindsTheUrl) {
 }
 
 TEST_F(DhcpParserTest, APadIsReadWithALength) {
-  EXPECT_EQ(Parse(TBytes{0} + kUrlOption), "");                   // 252 is the pad's length
-  EXPECT_EQ(Parse(TBytes{0, 2, 252, 1} + kUrlOption), "url");     // 252 is within the pad's value
-  EXPECT_EQ(Parse(TBytes{0, 1, 255, 252, 1, 'u', 255, 0}), "u");  // and so is 255
+  EXPECT_EQ(Parse(TBytes{0} + kUrlOption), "");                   // 252 is read as the pad's length
+  EXPECT_EQ(Parse(TBytes{0, 2, 252, 1} + kUrlOption), "url");     // 252 is inside the pad's value
+  EXPECT_EQ(Parse(TBytes{0, 1, 255, 252, 1, 'u', 255, 0}), "u");  // 255 is, too
 }
 
 TEST_F(DhcpParserTest, ReadsToTheLastByteOfTheAreaAndNoFurther) {
@@ -101,18 +101,18 @@ TEST_F(DhcpParserTest, ReadsToTheLastByteOfTheAreaAndNoFurther) {
   }
 }
 
-// Each ends, and none touches the page behind the area.
+// Every parse must end, and none may read the page after the area.
 TEST_F(DhcpParserTest, AnyByteMayFillTheArea) {
   for (int byte = 0; byte < 256; ++byte) {
     SCOPED_TRACE(byte);
     auto const value = static_cast<unsigned char>(byte);
     EXPECT_EQ(Parse(TBytes(kSize, value)), byte == 252 ? std::string(252, '\xfc') : "");
-    // The url at every distance from the end, claiming that length.
+    // A URL option of that length at every distance from the end.
     for (std::size_t at = 0; at < kSize; at = at == 0 ? 2 : at + 1) {
       std::size_t const room = kSize - at;
       std::string const url = Parse(FilledTo(at) + TBytes{252, value});
       EXPECT_EQ(url, value + 2u <= room ? std::string(value, '\0') : "") << at;
-      if (byte % 16 != 15) break;  // the distances with some of the lengths only
+      if (byte % 16 != 15) break;  // try every distance with some of the lengths only
     }
   }
 }

@@ -12,7 +12,7 @@ namespace NQRVZEP20 {
 
 using TBytes = std::vector<unsigned char>;
 
-// A recorded reply of a DHCP server, from hexadecimal text.
+// A recorded reply of a DHCP server, read from a file of hexadecimal text.
 inline TBytes RecordedReply(std::string const& name) {
   std::string digits = ReadFile(ZEP_TEST_DATA_DIR "/wpad/" + name);
   digits.erase(std::remove(digits.begin(), digits.end(), '\n'), digits.end());
@@ -22,7 +22,7 @@ inline TBytes RecordedReply(std::string const& name) {
   return bytes;
 }
 
-// An options area at the end of a page, with an unreadable page behind it.
+// An options area at the end of a page, before an unreadable page.
 class TOptionsArea {
 public:
   TOptionsArea() : fPage(static_cast<std::size_t>(::sysconf(_SC_PAGESIZE))) {
@@ -34,7 +34,7 @@ public:
   TOptionsArea& operator=(TOptionsArea const&) = delete;
 
   unsigned char* Data() { return fPages + fPage - AutoProxyDiscovery::kOptionsSize; }
-  // The bytes, as many as the area takes, and zeros behind them.
+  // Stores the bytes, as many as fit into the area, followed by zeros.
   void Hold(TBytes const& bytes) {
     std::fill_n(Data(), AutoProxyDiscovery::kOptionsSize, static_cast<unsigned char>(0));
     std::copy_n(bytes.begin(), std::min<std::size_t>(bytes.size(), AutoProxyDiscovery::kOptionsSize), Data());

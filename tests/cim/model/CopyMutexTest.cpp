@@ -1,4 +1,4 @@
-// The header alone: a caller that holds the mutex includes nothing else for it.
+// Includes no other header of the library: a caller that locks the mutex needs only this one.
 
 #include "TCIMCopy.h"
 
@@ -6,7 +6,7 @@
 
 namespace {
 
-TEST(CopyMutexTest, CanBeHeldWithTheHeaderAlone) {
+TEST(CopyMutexTest, CanBeLockedWithOnlyItsHeader) {
   boost::recursive_mutex::scoped_lock l(copyInstMutex);
   EXPECT_TRUE(l.owns_lock());
 }

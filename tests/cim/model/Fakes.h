@@ -1,7 +1,7 @@
 #pragma once
 
-// A small hand-made object model for the tests of this room. It records how it is called and fails on demand; whatever no
-// test needs throws kZEPStatusNotImplemented. What the interfaces have a body for is left out.
+// A small object model for the tests of this room. It records its calls and fails on demand. An operation that no test needs
+// throws kZEPStatusNotImplemented, or is left out when the interface has a default body.
 
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
@@ -25,10 +25,10 @@ using ECIMType = TCIMValue::TCIMType::ECIMType;
 
 [[noreturn]] inline void Refuse() { throw TZEPException(kZEPStatusNotImplemented); }
 
-// The contexts that an object was called with, and the status that its next lookups throw.
+// The contexts that an object was called with, the names looked up, and the status that its next lookups throw.
 struct TCalls {
   mutable std::vector<TCIMContext> fContexts;
-  mutable std::vector<std::string> fNames;  // what was looked up
+  mutable std::vector<std::string> fNames;  // the names looked up
   std::optional<EZEPStatusCode> fFailure;
 
   void Record(TCIMContext const& context) const { fContexts.push_back(context); }
@@ -103,7 +103,7 @@ class TFakeClass : public ICIMClass {
 public:
   TFakeClass(boost::shared_ptr<ICIMNamespace> ns, std::string name) : fNamespace(ns), fName(std::move(name)) {}
 
-  // A property of that type without default.
+  // Adds a property of that type without a default.
   TFakeClass& Add(std::string const& name, ECIMType type) {
     TCIMValue defaultValue;
     defaultValue.SetNullValue(type, 0);
@@ -168,7 +168,7 @@ public:
 
   std::map<std::string, boost::shared_ptr<TFakePropertyDecl>> fDecls;
   bool fAnswersUnknownByEmpty = false;
-  std::optional<EZEPStatusCode> fEnumerationFailure;  // of EnumerateInstances
+  std::optional<EZEPStatusCode> fEnumerationFailure;  // thrown by EnumerateInstances
   TCalls fCalls;
 
 private:
@@ -210,10 +210,10 @@ public:
     Refuse();
   }
 
-  TCalls fCalls;  // of GetClass
+  TCalls fCalls;  // calls of GetClass
   bool fAnswersUnknownByEmpty = false;
 
-  boost::shared_ptr<ICIMInstance> fInstance;  // what GetInstance answers
+  boost::shared_ptr<ICIMInstance> fInstance;  // returned by GetInstance
   std::optional<EZEPStatusCode> fInstanceFailure;
   mutable std::vector<TCIMReference const*> fLookedUp;
   mutable std::vector<TCIMContext> fLookedUpContexts;

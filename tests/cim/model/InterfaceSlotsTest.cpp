@@ -1,4 +1,5 @@
-// The order of the virtual operations that plug-ins and the library call on each other. Others may stand between them.
+// The order of the virtual operations through which plug-ins and the library call each other. Other operations may come
+// between them.
 
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
@@ -18,7 +19,7 @@ namespace {
 
 using TSlots = std::vector<std::size_t>;
 
-// Ascending, behind the two destructors.
+// Whether the slots are ascending and after the two destructors.
 bool AreInOrder(TSlots const& slots) { return slots.front() >= 3 && std::is_sorted(slots.begin(), slots.end()); }
 
 TEST(InterfaceSlotsTest, OperationsKeepTheirOrder) {
@@ -44,7 +45,7 @@ TEST(InterfaceSlotsTest, OperationsKeepTheirOrder) {
                           SlotOf(&INamespaceProviderManager::EnumerateNamespaceProviders)}));
 }
 
-TEST(TAddToVectorCallbackTest, AppendsAndGoesOn) {
+TEST(TAddToVectorCallbackTest, AppendsAndReturnsTrue) {
   std::vector<boost::shared_ptr<int>> numbers(1);
   boost::shared_ptr<int> const number(new int(7));
   boost::function<bool(boost::shared_ptr<int>)> const callback = TAddToVectorCallback<int>(numbers);

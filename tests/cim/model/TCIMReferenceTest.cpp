@@ -52,7 +52,7 @@ protected:
   boost::shared_ptr<TFakeNamespace> const ns_ = boost::make_shared<TFakeNamespace>();
 };
 
-// ---- Parsing: what is read ----
+// ---- Parsing: valid paths ----
 
 TEST_F(TCIMReferenceTest, ReadsPaths) {
   struct {
@@ -64,16 +64,16 @@ TEST_F(TCIMReferenceTest, ReadsPaths) {
       {"ns:X_Disk", "X_Disk", {}},
       {":X_Disk", "X_Disk", {}},
       {"root/cimv2:X_Disk", "X_Disk", {}},
-      {"a.b:X_Disk", "X_Disk", {}},  // a "." before the ":" is the namespace's
+      {"a.b:X_Disk", "X_Disk", {}},  // a "." before the ":" belongs to the namespace
       {"ns:X_Disk.Id=\"5\"", "X_Disk", {"Id=5"}},
       {":X_Disk.Id=\"5\"", "X_Disk", {"Id=5"}},
       {"a.b:X_Disk.Id=\"5\"", "X_Disk", {"Id=5"}},
       {"ns:X_Disk.Id=\"5\",Name=\"sda\"", "X_Disk", {"Id=5", "Name=sda"}},
       {"ns:X_Disk.Name=\"sda\",Id=\"5\"", "X_Disk", {"Id=5", "Name=sda"}},
-      {"ns:X_Disk.Id=\"5\".Name=\"sda\"", "X_Disk", {"Id=5", "Name=sda"}},  // "." and "," are alike between keys
+      {"ns:X_Disk.Id=\"5\".Name=\"sda\"", "X_Disk", {"Id=5", "Name=sda"}},  // "." separates keys just as "," does
       {"ns:X_Disk.Name=\"\"", "X_Disk", {"Name="}},
       {"ns:X_Disk.Name=\"a.b,c=d:e\"", "X_Disk", {"Name=a.b,c=d:e"}},
-      {"ns:X_Disk.Id=\" 7seven\"", "X_Disk", {"Id=7"}},  // as numbers are read from text
+      {"ns:X_Disk.Id=\" 7seven\"", "X_Disk", {"Id=7"}},  // the number is read as TCIMValue reads it from text
       {"ns:X_Disk.Id=\"none\"", "X_Disk", {"Id=0"}},
   };
   for (auto const& row : kRows) {
@@ -91,13 +91,13 @@ TEST_F(TCIMReferenceTest, AKeyHasTheDeclaredType) {
   EXPECT_EQ(KeyOf(disk, "Name"), TCIMValue("5"));
 }
 
-TEST_F(TCIMReferenceTest, NumbersOfOtherTypesAreKeysAsWell) {
+TEST_F(TCIMReferenceTest, NumbersOfOtherTypesCanBeKeys) {
   ns_->Class("X_Disk")->Add("Load", ECIMType::kCIMTypeReal64).Add("Offset", ECIMType::kCIMTypeSint64);
   EXPECT_EQ(KeysOf(Parsed("ns:X_Disk.Load=\"-0.5\",Offset=\"-9223372036854775808\"")),
             (TNames{"Load=-0.5", "Offset=-9223372036854775808"}));
 }
 
-TEST_F(TCIMReferenceTest, ACharacterAsAKeyIsSetButNeitherPrintedNorCompared) {
+TEST_F(TCIMReferenceTest, AChar16KeyIsSetButCannotBePrintedOrCompared) {
   ns_->Class("X_Disk")->Add("Letter", ECIMType::kCIMTypeChar16);
   TCIMReference const disk = Parsed("ns:X_Disk.Letter=\"C\"");
   EXPECT_EQ(KeyOf(disk, "Letter").GetType(), ECIMType::kCIMTypeChar16);
@@ -113,8 +113,8 @@ TEST_F(TCIMReferenceTest, WithoutNamespacePrefixAPathWithKeysIsAClassName) {
   EXPECT_EQ(log.Entries(), TNames({"[Error] Reference specifies invalid class, path=X_Disk.Id=\"5\""}));
 }
 
-// The class name that is asked for shows where each path is cut.
-TEST_F(TCIMReferenceTest, CutsTheClassName) {
+// The class name that is looked up shows where each path is split.
+TEST_F(TCIMReferenceTest, SplitsOffTheClassName) {
   struct {
     char const* path;
     char const* className;
@@ -133,7 +133,7 @@ TEST_F(TCIMReferenceTest, CutsTheClassName) {
       {"a:b:Y.Id=\"5\"", "b:Y"},
       {"//host:5988/ns:Y.Id=\"5\"", "5988/ns:Y"},
       {"a.b:Y.Id=\"5\"", "Y"},
-      {"Y.Name=\"a:b\"", "b\""},  // a ":" in a value counts when there is no prefix
+      {"Y.Name=\"a:b\"", "b\""},  // without a prefix, a ":" in a value counts as one
       {"Y.Name=\"a:b.c\"", "b"},
       {"ns:Y.Name=\"a:b.c\"", "Y"},
   };
@@ -178,7 +178,7 @@ TEST_F(TCIMReferenceTest, AnyPropertyOfTheClassMayBeAKeyOfThePath) {
             TNames({"Made=20240229120000.000000+060", "Seen=true"}));
 }
 
-// ---- Parsing: what fails ----
+// ---- Parsing: failures ----
 
 TEST_F(TCIMReferenceTest, MalformedPathsAreLoggedAsOneErrorAndThrowInvalidReference) {
   struct {
@@ -189,7 +189,7 @@ TEST_F(TCIMReferenceTest, MalformedPathsAreLoggedAsOneErrorAndThrowInvalidRefere
       {"Y_Disk", "Reference specifies invalid class, path=Y_Disk"},
       {"ns:Y_Disk", "Reference specifies invalid class, path=ns:Y_Disk"},
       {"ns:x_disk.Id=\"5\"", "Reference specifies invalid class, path=ns:x_disk.Id=\"5\""},
-      {"ns:Y_Disk.", "Reference specifies invalid class, path=ns:Y_Disk."},  // the class comes first
+      {"ns:Y_Disk.", "Reference specifies invalid class, path=ns:Y_Disk."},  // the class is read first
       {"ns:X_Disk.Size=\"5\"", "Reference specifies invalid property, property=Size, path=ns:X_Disk.Size=\"5\""},
       {"ns:X_Disk.Size=5", "Reference specifies invalid property, property=Size, path=ns:X_Disk.Size=5"},  // before the quote
       {"ns:X_Disk.Size=", "Reference specifies invalid property, property=Size, path=ns:X_Disk.Size="},
@@ -224,7 +224,7 @@ TEST_F(TCIMReferenceTest, MalformedPathsAreLoggedAsOneErrorAndThrowInvalidRefere
   }
 }
 
-TEST_F(TCIMReferenceTest, WhatWasReadBeforeAFailureStaysSet) {
+TEST_F(TCIMReferenceTest, PartsReadBeforeAFailureStaySet) {
   TCIMReference disk = Empty();
   EXPECT_STATUS(disk.SetPath("ns:X_Disk.Id=\"5\",Name=\"a"), kZEPStatusInvalidReference);
   EXPECT_EQ(disk.GetPath(), "X_Disk.Id=\"5\"");
@@ -254,7 +254,7 @@ TEST_F(TCIMReferenceTest, AnUnknownPropertyMayBeReportedByAnEmptyPointer) {
   EXPECT_EQ(log.Entries(), TNames({"[Error] Reference specifies invalid property, property=Size, path=ns:X_Disk.Size=\"5\""}));
 }
 
-TEST_F(TCIMReferenceTest, OtherFailuresOfTheClassLookupPassUnlogged) {
+TEST_F(TCIMReferenceTest, OtherFailuresOfTheClassLookupPassThroughUnlogged) {
   for (EZEPStatusCode const status : {kZEPStatusConnectionFailed, kZEPStatusInvalidReference, kZEPStatusFail}) {
     ns_->fCalls.fFailure = status;
     TLogCapture log;
@@ -270,7 +270,7 @@ TEST_F(TCIMReferenceTest, NotFoundOfTheClassLookupBecomesInvalidReference) {
   EXPECT_EQ(log.Entries(), TNames({"[Error] Reference specifies invalid class, path=ns:X_Disk"}));
 }
 
-TEST_F(TCIMReferenceTest, OtherFailuresOfThePropertyLookupPassUnlogged) {
+TEST_F(TCIMReferenceTest, OtherFailuresOfThePropertyLookupPassThroughUnlogged) {
   for (EZEPStatusCode const status : {kZEPStatusConnectionFailed, kZEPStatusInvalidReference, kZEPStatusFail}) {
     ns_->Class("X_Disk")->fCalls.fFailure = status;
     TLogCapture log;
@@ -281,7 +281,7 @@ TEST_F(TCIMReferenceTest, OtherFailuresOfThePropertyLookupPassUnlogged) {
   }
 }
 
-TEST_F(TCIMReferenceTest, FailuresOfReadingAValuePassUnlogged) {
+TEST_F(TCIMReferenceTest, FailuresOfReadingAValuePassThroughUnlogged) {
   TCIMValue nullStrings(ECIMType::kCIMTypeString, 4);
   ns_->Class("X_Disk")->Add("Made", ECIMType::kCIMTypeDateTime).Add("Names", nullStrings.GetType(), nullStrings);
   ns_->Class("X_Disk")->Add("Nothing", ECIMType::kCIMTypeInvalid);
@@ -345,14 +345,14 @@ TEST_F(TCIMReferenceTest, ReadsReferencesWithinReferences) {
   EXPECT_EQ(KeysOf(rack), TNames({R"(Link=X_Link.Disk="X_Disk.Id="5",Name="x\"y"",Port="1")", "Row=2"}));
 }
 
-TEST_F(TCIMReferenceTest, AReferenceKeyThatIsDeclaredOnlyByItsDefaultValueIsReadToo) {
+TEST_F(TCIMReferenceTest, AReferenceKeyMayHaveADefaultThatIsNotNull) {
   TCIMReference disk = Disk(1);
   ns_->Add("X_Start").Add("Disk", ECIMType::kCIMTypeReference, TCIMValue(disk));
   EXPECT_EQ(KeysOf(Parsed("ns:X_Start.Disk=\"ns:X_Disk.Id=\"5\"\"")), TNames({"Disk=X_Disk.Id=\"5\""}));
 }
 
-// It is the default value that tells a nested path. A declaration without it reads the value as text, escapes and all.
-TEST_F(TCIMReferenceTest, AReferenceTypeWithoutReferenceDefaultIsReadAsEscapedText) {
+// The default value, not the declared type, marks a key as a reference. Without one the value is read as escaped text.
+TEST_F(TCIMReferenceTest, AReferenceTypeWithoutAReferenceDefaultIsReadAsEscapedText) {
   ns_->Add("X_Loose").Add("Disk", ECIMType::kCIMTypeReference, TCIMValue());
   TCIMReference const loose = Parsed("ns:X_Loose.Disk=\"ns:X_Disk.Id=\\\"5\\\"\"");
   EXPECT_EQ(KeysOf(loose), TNames({"Disk=X_Disk.Id=\"5\""}));
@@ -362,8 +362,9 @@ TEST_F(TCIMReferenceTest, AReferenceTypeWithoutReferenceDefaultIsReadAsEscapedTe
   EXPECT_EQ(log.Entries(), TNames({"[Error] Reference specifies invalid class, path=ns:Y"}));
 }
 
-// A nested path without keys takes the closing quote, and all that follows, for its class name. So does one without prefix.
-TEST_F(TCIMReferenceTest, ANestedPathNeedsPrefixAndKeys) {
+// A nested path without keys or without a prefix takes the closing quote, and everything after it, as part of its class
+// name.
+TEST_F(TCIMReferenceTest, ANestedPathNeedsAPrefixAndKeys) {
   struct {
     char const* path;
     char const* className;
@@ -408,7 +409,7 @@ TEST_F(TCIMReferenceTest, ReferencesAreNestedAtMost100Deep) {
   }
 }
 
-TEST_F(TCIMReferenceTest, FailuresInANestedPathNameTheWholePathOnce) {
+TEST_F(TCIMReferenceTest, FailuresInANestedPathLogTheCompletePathOnce) {
   struct {
     char const* path;
     char const* message;
@@ -467,7 +468,7 @@ TEST_F(TCIMReferenceTest, PrintsKeysInByteOrderWithoutNamespaceAndEscaped) {
   EXPECT_EQ(disk.GetPath(), "X_Disk.Id=\"5\",Name=\"a\\\"b\"");
 }
 
-TEST_F(TCIMReferenceTest, PrintedPathsReadBackBehindAPrefix) {
+TEST_F(TCIMReferenceTest, PrintedPathsReadBackAfterAPrefix) {
   for (std::string const name : {"", "sda", "a\"b", "a\\b", "\\", "\"", "\\\"", "a\\nb", "a,b=c.d:e", " "}) {
     SCOPED_TRACE(name);
     TCIMReference disk = Empty();
@@ -524,7 +525,7 @@ TEST_F(TCIMReferenceTest, ANewReferenceHasOnlyItsNamespace) {
   EXPECT_EQ(reference.GetNameSpaceName(), "");
 }
 
-TEST_F(TCIMReferenceTest, KeepsNoNamespaceAlive) {
+TEST_F(TCIMReferenceTest, DoesNotKeepItsNamespaceAlive) {
   auto ns = boost::make_shared<TFakeNamespace>();
   TCIMReference const reference(ns, TCIMContext());
   EXPECT_EQ(ns.use_count(), 1);
@@ -543,7 +544,7 @@ TEST_F(TCIMReferenceTest, SetNamespaceReplacesTheNamespaceOnly) {
   EXPECT_FALSE(disk.GetNamespace());
 }
 
-TEST_F(TCIMReferenceTest, NamespaceNameIsALabelThatNothingTouches) {
+TEST_F(TCIMReferenceTest, NamespaceNameIsALabelThatOtherOperationsIgnore) {
   TCIMReference disk = Empty();
   disk.SetNameSpaceName("label");
   disk.SetPath("ns:X_Disk.Id=\"5\"");
@@ -568,14 +569,14 @@ TEST_F(TCIMReferenceTest, ParsingLooksEveryClassUpWithTheContextOfTheReference) 
   EXPECT_EQ(ns_->fCalls.fContexts, (std::vector<TCIMContext>{context, context}));
 }
 
-TEST_F(TCIMReferenceTest, SetContextReplacesTheContextWhole) {
+TEST_F(TCIMReferenceTest, SetContextReplacesTheCompleteContext) {
   TCIMReference disk(ns_, TCIMContext{{"who", TCIMValue("me")}});
   disk.SetContext(TCIMContext{{"why", TCIMValue(1u)}});
   disk.SetClassName("X_Disk");
   EXPECT_EQ(ns_->fCalls.fContexts, (std::vector<TCIMContext>{{{"why", TCIMValue(1u)}}}));
 }
 
-TEST_F(TCIMReferenceTest, EverythingElseIsAskedWithAnEmptyContext) {
+TEST_F(TCIMReferenceTest, OtherCallsPassAnEmptyContext) {
   ns_->fInstance = boost::make_shared<TFakeInstance>();
   TCIMReference disk(ns_, "ns:X_Disk.Id=\"5\"", TCIMContext{{"who", TCIMValue("me")}});
   disk.AddKeyValue("Name", TCIMValue("a"));
@@ -591,7 +592,7 @@ TEST_F(TCIMReferenceTest, EverythingElseIsAskedWithAnEmptyContext) {
   for (TCIMContext const& context : contexts) EXPECT_TRUE(context.empty());
 }
 
-TEST_F(TCIMReferenceTest, SetClassNamePassesTheFailuresOfTheLookup) {
+TEST_F(TCIMReferenceTest, FailuresOfTheLookupPassThroughSetClassName) {
   TLogCapture log;
   TCIMReference disk = Empty();
   EXPECT_STATUS(disk.SetClassName("Y_Disk"), kZEPStatusNotFound);
@@ -624,11 +625,11 @@ TEST_F(TCIMReferenceTest, TheClassCannotBeChangedOnceThereAreKeys) {
   EXPECT_STATUS(disk.SetClass(ns_->Class("X_Link")), kZEPStatusInvalidOpSequence);
   EXPECT_STATUS(disk.SetClass(disk.GetClass()), kZEPStatusInvalidOpSequence);
   EXPECT_STATUS(disk.SetClassName("X_Link"), kZEPStatusInvalidOpSequence);
-  EXPECT_STATUS(disk.SetClassName("Y_Link"), kZEPStatusNotFound);  // the lookup comes first
+  EXPECT_STATUS(disk.SetClassName("Y_Link"), kZEPStatusNotFound);  // the class is looked up first
   EXPECT_EQ(disk.GetPath(), "X_Disk.Id=\"5\"");
 }
 
-TEST_F(TCIMReferenceTest, ClearEmptiesNamespaceClassKeysAndElement) {
+TEST_F(TCIMReferenceTest, ClearRemovesNamespaceClassKeysAndElement) {
   ns_->fInstance = boost::make_shared<TFakeInstance>();
   TCIMReference disk(ns_, "ns:X_Disk.Id=\"5\"", TCIMContext{{"who", TCIMValue("me")}});
   disk.GetCIMElement(false);
@@ -642,7 +643,7 @@ TEST_F(TCIMReferenceTest, ClearEmptiesNamespaceClassKeysAndElement) {
   ns_->fCalls.fContexts.clear();
   disk.SetNamespace(ns_);
   disk.SetPath("ns:X_Disk");
-  EXPECT_EQ(ns_->fCalls.fContexts, (std::vector<TCIMContext>{{{"who", TCIMValue("me")}}}));  // the context stays
+  EXPECT_EQ(ns_->fCalls.fContexts, (std::vector<TCIMContext>{{{"who", TCIMValue("me")}}}));  // the context was not removed
 }
 
 // ---- Adding keys ----
@@ -692,7 +693,7 @@ TEST_F(TCIMReferenceTest, AddKeyValueOfAnotherTypeIsLoggedAndThrowsTypeMismatch)
   }
 }
 
-// Its type has no name, so the message cannot be built.
+// The type of the value has no name, so the message cannot be built.
 TEST_F(TCIMReferenceTest, AddKeyValueWithoutTypeThrowsTypeMismatchUnlogged) {
   TCIMReference disk = Empty();
   disk.SetClassName("X_Disk");
@@ -707,7 +708,7 @@ TEST_F(TCIMReferenceTest, FirstKeyWins) {
   disk.AddKeyValue("Id", TCIMValue(6u));
   EXPECT_EQ(disk.GetPath(), "X_Disk.Id=\"5\"");
   EXPECT_EQ(log.Entries(), TNames());
-  EXPECT_STATUS(disk.AddKeyValue("Id", TCIMValue("6")), kZEPStatusTypeMismatch);  // the checks come before
+  EXPECT_STATUS(disk.AddKeyValue("Id", TCIMValue("6")), kZEPStatusTypeMismatch);  // the checks come first
 }
 
 TEST_F(TCIMReferenceTest, EnumeratesKeysInByteOrderUntilFalse) {
@@ -732,15 +733,15 @@ TEST_F(TCIMReferenceTest, WithoutKeysTheElementIsTheClass) {
   EXPECT_FALSE(Empty().GetCIMElement(false));
 }
 
-TEST_F(TCIMReferenceTest, ClassOnlyIsTheClassAlsoWithKeys) {
+TEST_F(TCIMReferenceTest, ClassOnlyReturnsTheClassEvenWithKeys) {
   EXPECT_EQ(Disk(5).GetCIMElement(true), ns_->Class("X_Disk"));
   EXPECT_TRUE(ns_->fLookedUp.empty());
 }
 
-TEST_F(TCIMReferenceTest, WithKeysTheNamespaceOfTheClassIsAskedForThisReference) {
+TEST_F(TCIMReferenceTest, WithKeysTheInstanceIsLookedUpInTheNamespaceOfTheClass) {
   ns_->fInstance = boost::make_shared<TFakeInstance>();
   TCIMReference disk = Disk(5);
-  disk.SetNamespace(boost::make_shared<TFakeNamespace>());  // not this one
+  disk.SetNamespace(boost::make_shared<TFakeNamespace>());  // not the one used
   EXPECT_EQ(disk.GetCIMElement(false), ns_->fInstance);
   EXPECT_EQ(ns_->fLookedUp, (std::vector<TCIMReference const*>{&disk}));
 }
@@ -757,7 +758,7 @@ TEST_F(TCIMReferenceTest, TheElementIsLookedUpOnceAndNeverAgain) {
   EXPECT_EQ(ns_->fLookedUp.size(), 1u);
 }
 
-TEST_F(TCIMReferenceTest, AFailureOfTheLookUpPassesAndIsNotRemembered) {
+TEST_F(TCIMReferenceTest, AFailureOfTheLookupPassesThroughAndIsNotRemembered) {
   TCIMReference const disk = Disk(5);
   ns_->fInstanceFailure = kZEPStatusAccessDenied;
   EXPECT_STATUS(disk.GetCIMElement(false), kZEPStatusAccessDenied);
@@ -766,7 +767,7 @@ TEST_F(TCIMReferenceTest, AFailureOfTheLookUpPassesAndIsNotRemembered) {
   EXPECT_EQ(disk.GetCIMElement(false), ns_->fInstance);
 }
 
-TEST_F(TCIMReferenceTest, AnUnknownInstanceThrowsNotFoundAndIsAskedForAgain) {
+TEST_F(TCIMReferenceTest, AnUnknownInstanceThrowsNotFoundAndIsLookedUpAgain) {
   TCIMReference const disk = Disk(5);
   TLogCapture log;
   EXPECT_STATUS(disk.GetCIMElement(false), kZEPStatusNotFound);
@@ -776,13 +777,13 @@ TEST_F(TCIMReferenceTest, AnUnknownInstanceThrowsNotFoundAndIsAskedForAgain) {
   EXPECT_EQ(ns_->fLookedUp.size(), 2u);
 }
 
-TEST_F(TCIMReferenceTest, AClassWhoseNamespaceIsGoneThrowsBadWeakPtr) {
+TEST_F(TCIMReferenceTest, AClassWhoseNamespaceWasDestroyedThrowsBadWeakPtr) {
   auto ns = boost::make_shared<TFakeNamespace>();
   ns->Add("X_Disk").Add("Id", ECIMType::kCIMTypeUint32);
   TCIMReference const disk(ns, "ns:X_Disk.Id=\"5\"", TCIMContext());
   ns.reset();
   EXPECT_THROW(disk.GetCIMElement(false), boost::bad_weak_ptr);
-  EXPECT_EQ(disk.GetPath(), "X_Disk.Id=\"5\"");  // the class itself is kept
+  EXPECT_EQ(disk.GetPath(), "X_Disk.Id=\"5\"");  // the reference keeps the class alive
 }
 
 // ---- Copying and moving ----
@@ -890,7 +891,7 @@ TEST_F(TCIMReferenceTest, EqualMeansTheSameClassObjectAndEqualKeys) {
   EXPECT_FALSE(Empty() == Parsed("ns:X_Disk"));
 }
 
-TEST_F(TCIMReferenceTest, EqualityLooksAtNothingElse) {
+TEST_F(TCIMReferenceTest, EqualityIgnoresTheOtherParts) {
   TCIMReference disk(ns_, "ns:X_Disk.Id=\"5\"", TCIMContext{{"who", TCIMValue("me")}});
   disk.SetNameSpaceName("label");
   disk.SetNamespace(nullptr);
@@ -965,9 +966,9 @@ TEST_F(TCIMReferenceTest, ReferencesAreKeysOfOrderedContainers) {
   EXPECT_EQ(sizes.at(Disk(37)), 1u);
 }
 
-// ---- As values ----
+// ---- In a TCIMValue ----
 
-TEST_F(TCIMReferenceTest, ReferencesTravelInValues) {
+TEST_F(TCIMReferenceTest, ValuesCanHoldReferences) {
   TCIMReference disk = Disk(5);
   TCIMValue const value(disk);
   EXPECT_TRUE(value.IsReference());
@@ -1000,7 +1001,7 @@ protected:
   boost::shared_ptr<TMemoryNamespace> const ns_ = boost::make_shared<TMemoryNamespace>("root/storage");
 };
 
-TEST_F(TCIMReferenceInMemoryTest, APathLeadsToItsInstance) {
+TEST_F(TCIMReferenceInMemoryTest, APathResolvesToItsInstance) {
   auto const sda = ns_->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "s\"d\\a"}});
   auto const sdb = ns_->AddInstance("X_Disk", {{"Id", 6u}, {"Name", "sdb"}});
   EXPECT_EQ(Parsed("ns:X_Disk.Id=\"5\",Name=\"s\\\"d\\\\a\"").GetCIMElement(false), sda);
@@ -1009,7 +1010,7 @@ TEST_F(TCIMReferenceInMemoryTest, APathLeadsToItsInstance) {
   EXPECT_STATUS(Parsed("ns:X_Disk.Id=\"6\"").GetCIMElement(false), kZEPStatusNotFound);
 }
 
-TEST_F(TCIMReferenceInMemoryTest, ThePathOfAnInstanceLeadsBackToIt) {
+TEST_F(TCIMReferenceInMemoryTest, ThePathOfAnInstanceResolvesToTheInstance) {
   auto const disk = ns_->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "a\",\\b=c.d:e"}});
   TCIMReference const path = disk->GetPath(TCIMContext());
   EXPECT_EQ(path.GetCIMElement(false), disk);
@@ -1017,7 +1018,7 @@ TEST_F(TCIMReferenceInMemoryTest, ThePathOfAnInstanceLeadsBackToIt) {
   EXPECT_EQ(Parsed("ns:" + path.GetPath()).GetCIMElement(false), disk);
 }
 
-TEST_F(TCIMReferenceInMemoryTest, AReferenceKeyLeadsToItsInstance) {
+TEST_F(TCIMReferenceInMemoryTest, AReferenceKeyResolvesToItsInstance) {
   auto const disk = ns_->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "sda"}});
   auto const link = ns_->AddInstance("X_Link", {{"Disk", disk->GetReference()}, {"Port", 1}});
   TCIMReference const path = Parsed("ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\",Name=\"sda\"\",Port=\"1\"");
@@ -1032,8 +1033,8 @@ TEST_F(TCIMReferenceInMemoryTest, UnknownNamesAreInvalid) {
   }
 }
 
-// A class that is still being described answers unknown names with an empty pointer.
-TEST_F(TCIMReferenceInMemoryTest, UnknownNamesAreInvalidAlsoWhileTheClassIsDescribed) {
+// A class that is still being described returns an empty pointer for an unknown name.
+TEST_F(TCIMReferenceInMemoryTest, UnknownNamesAreInvalidWhileTheClassIsBeingDescribed) {
   auto const cls = ns_->GetClass("X_Disk", TCIMContext());
   cls->BeginDeclarations(TCIMContext());
   EXPECT_STATUS(Parsed("ns:X_Disk.Serial=\"5\""), kZEPStatusInvalidReference);

@@ -24,7 +24,7 @@ TCIMValue Strings(TNames const& texts) {
   return TCIMValue(ECIMType::kCIMTypeString, 0, std::vector<TCIMValue>(texts.begin(), texts.end()));
 }
 
-// The single-property queries: what each reads.
+// A query, and the class and property that it reads.
 struct TSingleQuery {
   char const* name;
   TQuery query;
@@ -64,7 +64,7 @@ std::vector<TSingleQuery> AllSingleQueries() {
   return queries;
 }
 
-// Everything that is built on a single-property query, with the class it depends on.
+// The queries that use a single-property query.
 std::vector<TSingleQuery> DerivedQueries() {
   using THelper = TCIMSchemaHelper;
   return {
@@ -106,7 +106,7 @@ protected:
 
 // ---- Constants ----
 
-TEST_F(TCIMSchemaHelperTest, Constants) {
+TEST_F(TCIMSchemaHelperTest, ConstantsHaveTheirValues) {
   EXPECT_EQ(TCIMSchemaHelper::kSystemCreationClassName, "QRVSG_ComputerSystem");
   EXPECT_EQ(TCIMSchemaHelper::kOperatingSystemCreationClassName, "QRVSG_OperatingSystem");
   EXPECT_EQ(TCIMSchemaHelper::kContextName, "nspID");
@@ -118,7 +118,7 @@ TEST_F(TCIMSchemaHelperTest, Constants) {
 
 // ---- Single properties ----
 
-TEST_F(TCIMSchemaHelperTest, ASingleQueryReadsItsPropertyOfItsClassAsItStandsAndLogsNothing) {
+TEST_F(TCIMSchemaHelperTest, ASinglePropertyQueryReturnsThePropertyUnchangedAndLogsNothing) {
   for (auto const& row : AllSingleQueries()) {
     SCOPED_TRACE(row.name);
     TLogCapture log;
@@ -128,7 +128,7 @@ TEST_F(TCIMSchemaHelperTest, ASingleQueryReadsItsPropertyOfItsClassAsItStandsAnd
   }
 }
 
-TEST_F(TCIMSchemaHelperTest, WhatIsMissingThrowsNotFound) {
+TEST_F(TCIMSchemaHelperTest, MissingDataThrowsNotFound) {
   auto queries = AllSingleQueries();
   for (auto const& derived : DerivedQueries()) queries.push_back(derived);
   for (auto const& row : queries) {
@@ -146,7 +146,7 @@ TEST_F(TCIMSchemaHelperTest, WhatIsMissingThrowsNotFound) {
     instance->fCalls.fFailure.reset();
     instance->Add(row.property, TCIMValue("1234ABC"));
     cls.fEnumerationFailure = kZEPStatusNotFound;
-    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // nor instances to enumerate
+    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // no instances to enumerate
     cls.fEnumerationFailure.reset();
     cls.AddInstance()->Add(row.property, TCIMValue("1234ABC"));
     EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // two instances
@@ -178,7 +178,7 @@ TEST_F(TCIMSchemaHelperTest, PlainQueriesThrowWhatTheConversionThrows) {
   }
 }
 
-TEST_F(TCIMSchemaHelperTest, OtherFailuresOfTheNamespacePass) {
+TEST_F(TCIMSchemaHelperTest, OtherFailuresOfTheNamespacePassThrough) {
   auto queries = AllSingleQueries();
   for (auto const& derived : DerivedQueries()) queries.push_back(derived);
   for (auto const& row : queries) {
@@ -199,12 +199,12 @@ TEST_F(TCIMSchemaHelperTest, OtherFailuresOfTheNamespacePass) {
   }
 }
 
-TEST_F(TCIMSchemaHelperTest, AnEmptyNamespaceIsAFailedAssertion) {
+TEST_F(TCIMSchemaHelperTest, AnEmptyNamespacePointerIsAFailedAssertion) {
   TEnvironmentGuard const mode("ZEP_BOOST_ASSERT", nullptr);
   EXPECT_STATUS(TCIMSchemaHelper::GetSystemName(nullptr), kZEPStatusFail);
 }
 
-TEST_F(TCIMSchemaHelperTest, EveryCallCarriesTheProviderToAsk) {
+TEST_F(TCIMSchemaHelperTest, EveryCallPassesTheProviderNameInItsContext) {
   auto queries = AllSingleQueries();
   for (auto const& derived : DerivedQueries()) queries.push_back(derived);
   for (auto const& row : queries) {
@@ -214,7 +214,7 @@ TEST_F(TCIMSchemaHelperTest, EveryCallCarriesTheProviderToAsk) {
     auto const property = instance->Add(row.property, TCIMValue("1234ABC"));
     try {
       row.query(ns);
-    } catch (TZEPException const&) {  // the text is no version: it has been read all the same
+    } catch (TZEPException const&) {  // the text is not a version, but it has been read
     }
     TCIMContext const expected = {{"nspID", TCIMValue("plugin")}};
     for (TCalls const* calls : {&ns->fCalls, &ns->Class(row.className)->fCalls, &instance->fCalls, &property->fCalls})
@@ -224,7 +224,7 @@ TEST_F(TCIMSchemaHelperTest, EveryCallCarriesTheProviderToAsk) {
   }
 }
 
-TEST_F(TCIMSchemaHelperTest, TheCallersContextIsCarriedAlongAndMayNameTheProvider) {
+TEST_F(TCIMSchemaHelperTest, TheCallersContextIsPassedOnAndMayNameTheProvider) {
   using THelper = TCIMSchemaHelper;
   struct {
     char const* name;
@@ -285,7 +285,7 @@ TEST_F(TCIMSchemaHelperTest, LoggedQueriesLogEachReasonAtDebug) {
 
 // ---- Machine type and model ----
 
-TEST_F(TCIMSchemaHelperTest, IsValidMachineType) {
+TEST_F(TCIMSchemaHelperTest, IsValidMachineTypeChecksTheFirstFourCharacters) {
   for (char const* text : {"1234", "abcD", "Z9z0", "1234-", "1234ABC", "1234\n"}) {
     SCOPED_TRACE(text);
     EXPECT_TRUE(TCIMSchemaHelper::IsValidMachineType(text));
@@ -299,7 +299,7 @@ TEST_F(TCIMSchemaHelperTest, IsValidMachineType) {
   }
 }
 
-TEST_F(TCIMSchemaHelperTest, IsValidMTM) {
+TEST_F(TCIMSchemaHelperTest, IsValidMTMChecksTheFirstSevenCharacters) {
   for (char const* text : {"1234ABC", "1234   ", "12345 x", "abcdxyz", "1234ABC-", "1234ABCDE"}) {
     SCOPED_TRACE(text);
     EXPECT_TRUE(TCIMSchemaHelper::IsValidMTM(text));
@@ -312,7 +312,7 @@ TEST_F(TCIMSchemaHelperTest, IsValidMTM) {
 
 struct TProductNameRow {
   char const* productName;
-  char const* mtm;  // null: no MTM in it
+  char const* mtm;  // null: there is no MTM in the name
 };
 
 TEST_F(TCIMSchemaHelperTest, FindsTheMTMInAProductName) {
@@ -323,7 +323,7 @@ TEST_F(TCIMSchemaHelperTest, FindsTheMTMInAProductName) {
       {"1234abc", "1234abc"},
       {"1234ABC   ", "1234ABC"},
       {"1234  ", "1234xxx"},
-      {"1234   ", "1234xxx"},  // its trailing blanks go first
+      {"1234   ", "1234xxx"},  // trailing blanks are removed first
       {"1234A C", "1234A C"},
       {"1234 BC", "1234 BC"},
       {"12345", nullptr},
@@ -348,9 +348,9 @@ TEST_F(TCIMSchemaHelperTest, FindsTheMTMInAProductName) {
       {"-[1234ABC]-[5678DEF]-", "1234ABC"},  // only the first counts
       {"Server X1-[1234   ]-", "1234xxx"},
       {"Server X1-[1234 B ]-", "1234 B "},
-      {"Server X1-[1234]BC]-", "1234xxx"},  // the 7 are none, the 4 are
+      {"Server X1-[1234]BC]-", "1234xxx"},  // 7 characters are not an MTM, 4 are a type
       {"Server X1-[1234ABC]x", "1234ABC"},
-      {"Server X1-[1234A]-", nullptr},  // the "]" is two places early
+      {"Server X1-[1234A]-", nullptr},  // the "]" is two positions early
       {"Server X1-[1234AB]-", nullptr},
       {"Server X1-[123]-", nullptr},
       {"Server X1-[1234ABCD]-", nullptr},
@@ -385,7 +385,7 @@ TEST_F(TCIMSchemaHelperTest, FindsTheMTMInLegacyProductNames) {
       {"System Model 200-[1234ABC]", "1234ABC"},
       {"System Model 200-[1234   ]", "1234xxx"},
 
-      // behind "- " nothing but the fixed place tells the MTM
+      // after "- " only the fixed position marks the MTM
       {"System Model 3000- 1234ABC--", "1234ABC"},
       {"System Model 3000- 1234ABC]-", "1234ABC"},
       {"System Model 3000- 1234ABCD-  ", "1234ABC"},
@@ -394,7 +394,7 @@ TEST_F(TCIMSchemaHelperTest, FindsTheMTMInLegacyProductNames) {
       {"System Model 3000- 12-4ABC--", nullptr},
       {"System Model 3000- 1234ABC-", nullptr},    // too short
       {"System Model 3000- 1234ABC---", nullptr},  // too long
-      {"System Model 3000- 1234ABC-]", nullptr},   // another closing
+      {"System Model 3000- 1234ABC-]", nullptr},   // another closing character
       {"System Model 3001- 1234ABC--", nullptr},   // another model
       {"system Model 3000- 1234ABC--", nullptr},
   };
@@ -457,7 +457,7 @@ TEST_F(TCIMSchemaHelperTest, ARawSerialNumberKeepsItsBlanks) {
 
 // ---- Parts of the data source's version ----
 
-TEST_F(TCIMSchemaHelperTest, PartsOfTheVersion) {
+TEST_F(TCIMSchemaHelperTest, TheVersionIsSplitAtItsDots) {
   struct {
     char const* version;
     char const* major;  // null: not found
@@ -519,7 +519,7 @@ private:
   std::set<std::string> classes_;
 };
 
-TEST_F(TCIMSchemaHelperEsxiTest, WhatIsMissingIsUnknown) {
+TEST_F(TCIMSchemaHelperEsxiTest, MissingDataIsUnknown) {
   for (bool const answersByEmpty : {false, true}) {
     ns_->fAnswersUnknownByEmpty = answersByEmpty;
     EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Unknown");
@@ -550,7 +550,7 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheLastModelWithBothBracketsIsTheProductName) {
   EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(ns_), "5678DEF");
 }
 
-TEST_F(TCIMSchemaHelperEsxiTest, TheMTMIsWhatStandsBetweenTheFirstBrackets) {
+TEST_F(TCIMSchemaHelperEsxiTest, TheMTMIsTheTextBetweenTheFirstBrackets) {
   struct {
     char const* model;
     char const* mtm;
@@ -560,7 +560,7 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheMTMIsWhatStandsBetweenTheFirstBrackets) {
       {"Server X1-[1234 - A]-", "1234 - A"},
       {"Server X1-[1234ABC]-[5678DEF]-", "1234ABC"},
       {"Server X1-[-[1234ABC]-", "-[1234ABC"},
-      {"Server X1-[]-", "Unknown"},           // nothing between
+      {"Server X1-[]-", "Unknown"},           // no text between
       {"Server ]-X1-[1234ABC]-", "Unknown"},  // the first "]-" comes first
       {"]--[", "Unknown"},
       {"Server X1", "Unknown"},
@@ -581,12 +581,12 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheLastLargeBuildNumberIsTheOperatingSystem) {
   EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "23456");
 }
 
-TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberMayBeANumber) {
+TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberMayBeAnInteger) {
   Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue(20000000000ul));
   EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "20000000000");
 }
 
-TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberOfAnotherTypeIsPassedOver) {
+TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberOfAnotherTypeIsSkipped) {
   Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue("12345"));
   Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", Strings({"23456"}));
   Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue(TCIMChar16(std::string("x"))));
@@ -612,7 +612,7 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheSerialNumberIsThatOfTheLastChassisThatHasOne
   EXPECT_EQ(SerialNumber(), "any text ");
 }
 
-TEST_F(TCIMSchemaHelperEsxiTest, APlaceholderGivesWayToTheOtherIdentifyingInfo) {
+TEST_F(TCIMSchemaHelperEsxiTest, APlaceholderIsReplacedByTheOtherIdentifyingInfo) {
   struct {
     char const* serialNumber;
     char const* result;
@@ -628,7 +628,7 @@ TEST_F(TCIMSchemaHelperEsxiTest, APlaceholderGivesWayToTheOtherIdentifyingInfo) 
   }
 }
 
-TEST_F(TCIMSchemaHelperEsxiTest, TheOtherIdentifyingInfoIsTheTextBehindTheColonOfTheFirstEntryWithOne) {
+TEST_F(TCIMSchemaHelperEsxiTest, TheOtherIdentifyingInfoIsTheTextAfterTheColonOfTheFirstEntryWithOne) {
   TCIMValue const withNull(ECIMType::kCIMTypeString, 0, {NullOf(ECIMType::kCIMTypeString), TCIMValue("SN:A")});
   struct {
     char const* what;
@@ -666,7 +666,7 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheLastSystemWithIdentifyingInfoCounts) {
   EXPECT_EQ(SerialNumber(), "B");
 }
 
-TEST_F(TCIMSchemaHelperEsxiTest, OtherFailuresOfTheNamespacePass) {
+TEST_F(TCIMSchemaHelperEsxiTest, OtherFailuresOfTheNamespacePassThrough) {
   ns_->fCalls.fFailure = kZEPStatusConnectionFailed;
   EXPECT_STATUS(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), kZEPStatusConnectionFailed);
   EXPECT_STATUS(TCIMSchemaHelper::GetMTM_vmwesxi(ns_), kZEPStatusConnectionFailed);
@@ -680,7 +680,7 @@ TEST_F(TCIMSchemaHelperEsxiTest, OtherFailuresOfTheNamespacePass) {
   EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Unknown");
 }
 
-TEST_F(TCIMSchemaHelperEsxiTest, LogsNothingAndCarriesTheProviderToAsk) {
+TEST_F(TCIMSchemaHelperEsxiTest, LogsNothingAndPassesTheProviderNameInItsContext) {
   TLogCapture log;
   TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_);
   TCIMSchemaHelper::GetMTM_vmwesxi(ns_);
@@ -694,7 +694,7 @@ TEST_F(TCIMSchemaHelperEsxiTest, LogsNothingAndCarriesTheProviderToAsk) {
 
 // ---- Against a namespace in memory ----
 
-TEST(TCIMSchemaHelperInMemoryTest, AnswersForAFilledNamespace) {
+TEST(TCIMSchemaHelperInMemoryTest, QueriesReadAFilledNamespace) {
   auto const ns = boost::make_shared<TMemoryNamespace>("root/cimv2");
   ns->DefineClass("QRVSG_ComputerSystem")
       .Key("Name", "string")

@@ -29,7 +29,7 @@ private:
 
 boost::shared_ptr<TNamedProvider> ProviderNamed(std::string const& name) { return boost::make_shared<TNamedProvider>(name); }
 
-// The registry of the process keeps its providers for good, so most tests make a registry of their own.
+// The process registry keeps its providers for ever, so most tests create a registry of their own.
 class TNamespaceProviderManagerTest : public testing::Test {
 protected:
   std::vector<boost::shared_ptr<INamespaceProvider>> Enumerate(std::size_t stopAfter = 1000) {
@@ -53,12 +53,12 @@ TEST_F(TNamespaceProviderManagerTest, FindsAProviderByItsName) {
   EXPECT_EQ(manager_.GetNamespaceProvider("Host"), host);
 }
 
-TEST_F(TNamespaceProviderManagerTest, TheOneOfTheProcessIsMadeWhenTheLibraryIsLoaded) {
+TEST_F(TNamespaceProviderManagerTest, TheProcessRegistryIsCreatedWhenTheLibraryIsLoaded) {
   EXPECT_TRUE(gIsThereBeforeMain);
   EXPECT_EQ(TNamespaceProviderManager::GetInstance(), TNamespaceProviderManager::fgInstance);
 }
 
-TEST_F(TNamespaceProviderManagerTest, AProviderWithoutANameToTellIsNotFiled) {
+TEST_F(TNamespaceProviderManagerTest, AProviderWhoseGetNameThrowsIsNotRegistered) {
   struct TNameless : TNamedProvider {
     TNameless() : TNamedProvider("") {}
     std::string const& GetName(TCIMContext const&) const override { throw TZEPException(kZEPStatusAccessDenied); }
@@ -67,7 +67,7 @@ TEST_F(TNamespaceProviderManagerTest, AProviderWithoutANameToTellIsNotFiled) {
   EXPECT_TRUE(Enumerate().empty());
 }
 
-TEST_F(TNamespaceProviderManagerTest, AsksForTheNameOnceWithAnEmptyContext) {
+TEST_F(TNamespaceProviderManagerTest, GetNameIsCalledOnceWithAnEmptyContext) {
   auto const host = ProviderNamed("Host");
   manager_.RegisterNamespaceProvider(host);
   manager_.GetNamespaceProvider("Host");
@@ -153,7 +153,7 @@ TEST_F(TNamespaceProviderManagerTest, KeepsItsProvidersAlive) {
   EXPECT_TRUE(watched.expired());
 }
 
-TEST(TRootObjectTest, HandsOutTheOneRegistryOfTheProcess) {
+TEST(TRootObjectTest, ReturnsTheProcessRegistry) {
   boost::shared_ptr<INamespaceProviderManager> const manager = TRootObject::GetNamespaceProviderManager();
   ASSERT_TRUE(manager);
   EXPECT_EQ(manager, TRootObject::GetNamespaceProviderManager());
@@ -161,10 +161,10 @@ TEST(TRootObjectTest, HandsOutTheOneRegistryOfTheProcess) {
   OnNewThread([&] { EXPECT_EQ(manager, TNamespaceProviderManager::GetInstance()); });
 }
 
-// The use count shows that the registry keeps itself: one more owner than those of this test.
-TEST(TRootObjectTest, TheRegistryOwnsItself) { EXPECT_EQ(TNamespaceProviderManager::GetInstance().use_count(), 2); }
+// Of the two owners, one is this test's temporary pointer and the other is the library.
+TEST(TRootObjectTest, TheLibraryKeepsTheRegistryAlive) { EXPECT_EQ(TNamespaceProviderManager::GetInstance().use_count(), 2); }
 
-TEST(TRootObjectTest, WhatIsRegisteredThereIsFoundThroughTheInterface) {
+TEST(TRootObjectTest, ARegisteredProviderIsFoundThroughTheInterface) {
   auto const provider = ProviderNamed("TRootObjectTest");
   TRootObject::GetNamespaceProviderManager()->RegisterNamespaceProvider(provider);
   EXPECT_EQ(TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("TRootObjectTest"), provider);

@@ -1,6 +1,6 @@
 #pragma once
 
-// An object model around another one: it writes down every call that a copy makes, in order, and a test may let any of them
+// An object model that wraps another one. It records every call that a copy makes, in order, and a test can make any call
 // fail.
 
 #include "ICIMClass.h"
@@ -25,10 +25,10 @@ namespace NQRVZEP20 {
 
 struct TTrace {
   std::vector<std::string> fCalls;
-  std::map<std::string, std::function<void()>> fOnCall;  // what happens before the call is passed on
-  std::string fEmptyAnswer;                              // the call that is answered with an empty pointer and not passed on
+  std::map<std::string, std::function<void()>> fOnCall;  // run before the call is passed on
+  std::string fEmptyAnswer;                              // this call returns an empty pointer and is not passed on
   bool fAnswersUnknownClassByEmpty = false;
-  std::size_t fContextEntries = 0;  // that were handed over in all calls
+  std::size_t fContextEntries = 0;  // the number of entries in the contexts of all calls
 
   void Record(std::string const& call, TCIMContext const& context) {
     fCalls.push_back(call);
@@ -37,7 +37,7 @@ struct TTrace {
     if (found != fOnCall.end()) found->second();
   }
 
-  // The same for a call that returns a pointer; false when it is to be answered with an empty one.
+  // Records a call that returns a pointer. False when the call must return an empty one.
   bool RecordQuery(std::string const& call, TCIMContext const& context) {
     Record(call, context);
     return call != fEmptyAnswer;
@@ -245,7 +245,7 @@ private:
   }
 };
 
-// `label` stands before every class name: "src:X_Disk".
+// `label` precedes every class name, as in "src:X_Disk".
 class TTracedNamespace : public ICIMNamespace {
 public:
   TTracedNamespace(TTrace& trace, boost::shared_ptr<ICIMNamespace> inner, std::string const& label)

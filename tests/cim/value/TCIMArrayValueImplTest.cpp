@@ -26,9 +26,9 @@ TEST(TCIMArrayValueImplTest, PrintsItsElementsBetweenBraces) {
   EXPECT_EQ(TImpl(TElements{TCIMValue(0.5), TCIMValue(1e6)}).ToString(10), "{ 0.5, 1e+06 }");
 }
 
-TEST(TCIMArrayValueImplTest, AnEmptyArrayKeepsBothBlanks) {
+TEST(TCIMArrayValueImplTest, AnEmptyArrayPrintsBothBlanks) {
   EXPECT_EQ(TImpl(TElements()).ToString(10), "{  }");
-  EXPECT_EQ(TImpl(TElements()).ToString(2), "{  }");  // no element to refuse the radix
+  EXPECT_EQ(TImpl(TElements()).ToString(2), "{  }");  // no element refuses the radix
 }
 
 TEST(TCIMArrayValueImplTest, StringsAreNotQuoted) {
@@ -52,7 +52,7 @@ TEST(TCIMArrayValueImplTest, AnArrayInAnArrayPrintsItsOwnBraces) {
             "{ { 1 }, {  } }");
 }
 
-TEST(TCIMArrayValueImplTest, ElementsOfEveryKindPrintAsTheyDoAlone) {
+TEST(TCIMArrayValueImplTest, ElementsPrintAsTheyDoOutsideAnArray) {
   TCIMDateTime const day(std::string("00000001000000.000000:000"));
   EXPECT_EQ(TImpl(TElements{TCIMValue(day), TCIMValue(day)}).ToString(10),
             "{ 00000001000000.000000:000, 00000001000000.000000:000 }");
@@ -63,7 +63,7 @@ TEST(TCIMArrayValueImplTest, ElementsOfEveryKindPrintAsTheyDoAlone) {
   EXPECT_EQ(TImpl(TElements{most, most}).ToString(16), "{ FFFFFFFFFFFFFFFF, FFFFFFFFFFFFFFFF }");
 }
 
-TEST(TCIMArrayValueImplTest, PrintingThrowsWhatAnElementThrows) {
+TEST(TCIMArrayValueImplTest, PrintingThrowsWhatPrintingAnElementThrows) {
   EXPECT_STATUS(TImpl(TElements{Uint8(1), NullOf(TType::kCIMTypeUint8)}).ToString(10), kZEPStatusValueIsNULL);
   EXPECT_STATUS(TImpl(TElements{TCIMValue(0.5), TCIMValue(1.5)}).ToString(8), kZEPStatusNotSupported);
   EXPECT_STATUS(TImpl(TElements{TCIMValue(true)}).ToString(7), kZEPStatusNotSupported);
@@ -73,7 +73,7 @@ TEST(TCIMArrayValueImplTest, PrintingThrowsWhatAnElementThrows) {
   EXPECT_STATUS(TImpl(TElements{TCIMValue(TCIMChar16(std::string("a")))}).ToString(10), kZEPStatusInvalidDateTime);
 }
 
-TEST(TCIMArrayValueImplTest, ElementsAreEditedInPlaceThroughAConstant) {
+TEST(TCIMArrayValueImplTest, ElementsOfAConstantArrayCanBeEditedInPlace) {
   TImpl const data(TElements{Uint8(1)});
   TElements& elements = data;
   elements[0] = TCIMValue("text of any type");
@@ -117,7 +117,7 @@ struct TEqualityRow {
   bool equal;
 };
 
-TEST(TCIMArrayValueImplTest, EqualsAnArrayOfEqualElementsInOrder) {
+TEST(TCIMArrayValueImplTest, ArraysWithEqualElementsInOrderAreEqual) {
   TEqualityRow const rows[] = {
       {"the same", {Uint8(1), Uint8(2)}, ArrayOf(TType::kCIMTypeUint8, {Uint8(1), Uint8(2)}), true},
       {"another order", {Uint8(1), Uint8(2)}, ArrayOf(TType::kCIMTypeUint8, {Uint8(2), Uint8(1)}), false},
@@ -142,7 +142,7 @@ TEST(TCIMArrayValueImplTest, EqualsAnArrayOfEqualElementsInOrder) {
   for (auto const& row : rows) EXPECT_EQ(TImpl(row.mine) == row.other, row.equal) << row.what;
 }
 
-TEST(TCIMArrayValueImplTest, AgainstANullArrayThrowsValueIsNull) {
+TEST(TCIMArrayValueImplTest, ComparingWithANullArrayThrowsValueIsNull) {
   EXPECT_STATUS((void)(TImpl(TElements{Uint8(1)}) == TCIMValue(TType::kCIMTypeUint8, 4)), kZEPStatusValueIsNULL);
 }
 
@@ -153,7 +153,7 @@ TEST(TCIMArrayValueImplTest, OrderIsNotImplemented) {
     EXPECT_STATUS((void)(data < other), kZEPStatusNotImplemented);
 }
 
-// ---- As the handle shows it ----
+// ---- Through TCIMValue ----
 
 TEST(TCIMArrayValueImplTest, ArrayLessThanThrows) {
   TCIMValue const one = ArrayOf(TType::kCIMTypeUint8, {Uint8(1)}), two = ArrayOf(TType::kCIMTypeUint8, {Uint8(2)});
@@ -161,9 +161,9 @@ TEST(TCIMArrayValueImplTest, ArrayLessThanThrows) {
   EXPECT_STATUS((void)(one >= two), kZEPStatusNotImplemented);
   EXPECT_STATUS((void)(one > two), kZEPStatusNotImplemented);
   EXPECT_STATUS((void)(one <= two), kZEPStatusNotImplemented);
-  EXPECT_TRUE(one <= TCIMValue(one));  // == is asked first
+  EXPECT_TRUE(one <= TCIMValue(one));  // == is evaluated first
   EXPECT_FALSE(one > TCIMValue(one));
-  EXPECT_TRUE(one < ArrayOf(TType::kCIMTypeSint8, {}));  // by tag
+  EXPECT_TRUE(one < ArrayOf(TType::kCIMTypeSint8, {}));  // decided by the tag
 }
 
 TEST(TCIMArrayValueImplTest, SortingArraysThrows) {
@@ -171,11 +171,11 @@ TEST(TCIMArrayValueImplTest, SortingArraysThrows) {
   EXPECT_STATUS(std::sort(arrays.begin(), arrays.end()), kZEPStatusNotImplemented);
 }
 
-TEST(TCIMArrayValueImplTest, EditingTheVectorChangesWhatTheHandlePrintsNext) {
+TEST(TCIMArrayValueImplTest, EditingTheVectorChangesTheTextOfTheValue) {
   TCIMValue const value(TType::kCIMTypeString, 1, {TCIMValue("a")});
   ElementsOf(value).push_back(TCIMValue("b"));
   EXPECT_EQ(value.ToString(), "{ a, b }");
-  EXPECT_EQ(value.GetMaxArraySize(), 1u);  // compared with nothing
+  EXPECT_EQ(value.GetMaxArraySize(), 1u);  // not checked against the number of elements
 }
 
 }  // namespace

@@ -22,12 +22,12 @@ TEST(TCIMChar16Test, PrintsItsCodeNotALetter) {
   EXPECT_EQ(TCIMChar16(65535).GetValue(), 65535);
 }
 
-TEST(TCIMChar16Test, ANewOneIsCodeZeroAndNotNull) {
+TEST(TCIMChar16Test, ANewCharacterHasCodeZeroAndIsNotNull) {
   EXPECT_EQ(TCIMChar16().GetValue(), 0);
   EXPECT_EQ(TCIMChar16().ToString(), "0");
 }
 
-TEST(TCIMChar16Test, FromTextIsNullWhateverTheTextSays) {
+TEST(TCIMChar16Test, ACharacterFromAnyTextIsNull) {
   for (std::string const& text : {std::string("A"), std::string("65"), std::string()}) {
     SCOPED_TRACE(text);
     TCIMChar16 const character(text);
@@ -36,7 +36,7 @@ TEST(TCIMChar16Test, FromTextIsNullWhateverTheTextSays) {
   }
 }
 
-TEST(TCIMChar16Test, AnyTwoAreEqualAndEachIsLess) {
+TEST(TCIMChar16Test, AnyTwoCharactersAreEqualAndEachIsLess) {
   TCIMChar16 const a(65), b(66);
   EXPECT_TRUE(a == b);
   EXPECT_TRUE(b == a);
@@ -45,7 +45,7 @@ TEST(TCIMChar16Test, AnyTwoAreEqualAndEachIsLess) {
   EXPECT_TRUE(a < a);
 }
 
-TEST(TCIMChar16Test, ANullOneCannotBeCompared) {
+TEST(TCIMChar16Test, ComparingANullCharacterThrows) {
   TCIMChar16 const a(65), null = NullCharacter();
   EXPECT_STATUS((void)(a == null), kZEPStatusInvalidDateTime);
   EXPECT_STATUS((void)(null == a), kZEPStatusInvalidDateTime);
@@ -69,17 +69,17 @@ TEST(TCIMChar16Test, CopiesShareNothing) {
   EXPECT_EQ(assigned.ToString(), "65");
 }
 
-// ---- What it holds ----
+// ---- The body ----
 
 TEST(TCIMChar16ImplTest, AnEmptyPointerIsAFailedAssertion) {
   TEnvironmentGuard const unset("ZEP_BOOST_ASSERT", nullptr);
   boost::shared_ptr<TCIMChar16Impl> const empty;
   EXPECT_STATUS((void)(TCIMChar16Impl(65) == empty), kZEPStatusFail);
   EXPECT_STATUS((void)(TCIMChar16Impl(65) < empty), kZEPStatusFail);
-  EXPECT_STATUS((void)(TCIMChar16Impl(std::string("A")) == empty), kZEPStatusInvalidDateTime);  // asks for itself first
+  EXPECT_STATUS((void)(TCIMChar16Impl(std::string("A")) == empty), kZEPStatusInvalidDateTime);  // its own NULL is checked first
 }
 
-TEST(TCIMChar16ImplTest, ComparesWithABodyAsWithAPointerToIt) {
+TEST(TCIMChar16ImplTest, ComparesWithAnObjectAsWithAPointer) {
   TCIMChar16Impl const a(65), b(66), null(std::string("a"));
   EXPECT_TRUE(a == b);
   EXPECT_TRUE(a < b);
@@ -88,7 +88,7 @@ TEST(TCIMChar16ImplTest, ComparesWithABodyAsWithAPointerToIt) {
   EXPECT_STATUS((void)(null < a), kZEPStatusInvalidDateTime);
 }
 
-TEST(TCIMChar16ImplTest, ComparesWithoutLookingAtTheCodes) {
+TEST(TCIMChar16ImplTest, ComparisonIgnoresTheCodes) {
   auto const other = boost::make_shared<TCIMChar16Impl>((unsigned short)66);
   EXPECT_TRUE(TCIMChar16Impl(65) == other);
   EXPECT_TRUE(TCIMChar16Impl(67) < other);
@@ -97,9 +97,9 @@ TEST(TCIMChar16ImplTest, ComparesWithoutLookingAtTheCodes) {
   EXPECT_STATUS((void)(TCIMChar16Impl(std::string()) < other), kZEPStatusInvalidDateTime);
 }
 
-// ---- As the data of a value ----
+// ---- As the data of a TCIMValue ----
 
-TEST(TCIMChar16ValueImplTest, PrintsTheCodeWhateverTheRadix) {
+TEST(TCIMChar16ValueImplTest, PrintsTheCodeInDecimalForAnyRadix) {
   TCIMChar16ValueImpl const data(TCIMChar16(255));
   for (int radix : {0, 2, 8, 10, 16}) EXPECT_EQ(data.ToString(static_cast<unsigned char>(radix)), "255") << radix;
   EXPECT_EQ(TCIMChar16ValueImpl(data).ToString(10), "255");
@@ -125,7 +125,7 @@ TEST(TCIMChar16ValueImplTest, RefusesEveryOtherConversion) {
   EXPECT_STATUS(data.operator std::vector<TCIMValue>&(), kZEPStatusTypeMismatch);
 }
 
-TEST(TCIMChar16ValueImplTest, AnyTwoAreEqualAndEachIsLess) {
+TEST(TCIMChar16ValueImplTest, AnyTwoCharactersAreEqualAndEachIsLess) {
   TCIMChar16ValueImpl const data(TCIMChar16(65));
   EXPECT_TRUE(data == TCIMValue(TCIMChar16(66)));
   EXPECT_TRUE(data < TCIMValue(TCIMChar16(64)));
@@ -156,7 +156,7 @@ TEST(TCIMChar16ValueImplTest, ANullCharacterIsNotANullValue) {
   EXPECT_FALSE(value == TCIMValue("A"));
 }
 
-TEST(TCIMChar16ValueImplTest, AgainstANullValueThrowsValueIsNull) {
+TEST(TCIMChar16ValueImplTest, ComparingWithANullValueThrowsValueIsNull) {
   TCIMValue const null(TCIMValue::TCIMType::kCIMTypeChar16, 0);
   EXPECT_STATUS((void)(TCIMChar16ValueImpl(TCIMChar16(65)) == null), kZEPStatusValueIsNULL);
   EXPECT_STATUS((void)(TCIMChar16ValueImpl(TCIMChar16(65)) < null), kZEPStatusValueIsNULL);

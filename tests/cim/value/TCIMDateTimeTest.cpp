@@ -19,7 +19,7 @@ constexpr char kLordHowe[] = "LHST-10:30LHDT-11,M10.1.0,M4.1.0";  // daylight sa
 constexpr unsigned short kMaxShort = std::numeric_limits<unsigned short>::max();
 constexpr unsigned int kMaxInt = std::numeric_limits<unsigned int>::max();
 
-// What valid times, comparison and arithmetic give depends on the zone; a test that names none runs in UTC.
+// Validation, comparison and arithmetic depend on the time zone. A test that sets none runs in UTC.
 class TCIMDateTimeTest : public testing::Test {
 protected:
   TEnvironmentGuard fZone{"TZ", kUTC};
@@ -29,7 +29,7 @@ TCIMDateTime At(char const* text) { return TCIMDateTime(std::string(text)); }
 
 // ---- NULL, copies ----
 
-TEST_F(TCIMDateTimeTest, NewOneIsNull) {
+TEST_F(TCIMDateTimeTest, ANewDatetimeIsNull) {
   TCIMDateTime const dateTime;
   EXPECT_TRUE(dateTime.IsNull());
   EXPECT_FALSE(dateTime.IsInterval());
@@ -86,7 +86,7 @@ TEST_F(TCIMDateTimeTest, MayBeAssignedFromItself) {
   EXPECT_EQ(dateTime.ToString(), "20070315143000.000000+060");
 }
 
-TEST_F(TCIMDateTimeTest, BodyIsTheOneInUse) {
+TEST_F(TCIMDateTimeTest, GetBodyReturnsTheBodyInUse) {
   TCIMDateTime dateTime;
   dateTime.GetBody()->Set(1, 2, 3, 4, 5);
   EXPECT_EQ(dateTime.ToString(), "00000001020304.000005:000");
@@ -144,7 +144,7 @@ TEST_F(TCIMDateTimeTest, SetChangesTheKind) {
   EXPECT_FALSE(dateTime.IsInterval());
 }
 
-TEST_F(TCIMDateTimeTest, IntervalFieldsAreLimitedButForTheDays) {
+TEST_F(TCIMDateTimeTest, IntervalFieldsExceptTheDaysAreLimited) {
   struct TRow {
     unsigned int days;
     unsigned short hours, minutes, seconds;
@@ -173,7 +173,7 @@ TEST_F(TCIMDateTimeTest, IntervalFieldsAreLimitedButForTheDays) {
   }
 }
 
-TEST_F(TCIMDateTimeTest, TimestampIsValidWhereMktimeGivesAnythingButMinusOne) {
+TEST_F(TCIMDateTimeTest, TimestampIsValidUnlessMktimeReturnsMinusOne) {
   struct TRow {
     char const* zone;
     unsigned short year, month;
@@ -190,8 +190,8 @@ TEST_F(TCIMDateTimeTest, TimestampIsValidWhereMktimeGivesAnythingButMinusOne) {
       {kUTC, kMaxShort, kMaxShort, kMaxInt, kMaxShort, kMaxShort, kMaxShort, 0, 32767, true},
       {kUTC, kMaxShort, kMaxShort, 31, kMaxShort, kMaxShort, kMaxShort, 0, -32768, true},
       {kUTC, 0, 0, 0, 0, 0, 0, 0, 0, true},
-      {kUTC, 2007, 3, 15, 14, 30, 0, kMaxInt, 60, true},  // microseconds are not examined
-      // The one instant that mktime reports as -1, however it is spelled.
+      {kUTC, 2007, 3, 15, 14, 30, 0, kMaxInt, 60, true},  // microseconds are not checked
+      // The one instant that mktime reports as -1, written in several ways.
       {kUTC, 1969, 12, 31, 23, 59, 59, 0, 0, false},
       {kUTC, 1969, 12, 31, 23, 59, 58, 0, 0, true},
       {kUTC, 1969, 12, 31, 23, 59, 60, 0, 0, true},
@@ -199,13 +199,13 @@ TEST_F(TCIMDateTimeTest, TimestampIsValidWhereMktimeGivesAnythingButMinusOne) {
       {kUTC, 1970, 1, 2, 0, 59, 59, 0, 1500, false},
       {kUTC, 1970, 2, 0, 0, 0, 0, 0, 0, true},
       {kUTC, 1970, 1, 0, 23, 59, 59, 0, 0, false},
-      {kUTC, 1972, 1, 4294966566u, 23, 59, 59, 0, 0, false},  // a day of more than 31 bits counts backwards
+      {kUTC, 1972, 1, 4294966566u, 23, 59, 59, 0, 0, false},  // a day of more than 31 bits becomes negative
       {kUTC, 1972, 1, 4294966565u, 23, 59, 59, 0, 0, true},
       {kEastHour, 1970, 1, 2, 0, 59, 59, 0, 1440, false},
       {kEastHour, 1969, 12, 31, 23, 59, 59, 0, 0, true},
       {"XST5", 1969, 12, 31, 18, 59, 59, 0, 0, false},
       {"XST5", 1969, 12, 31, 23, 59, 59, 0, 0, true},
-      // The epoch's date is valid whatever the time fields.
+      // The epoch date is valid with any time fields.
       {kUTC, 1970, 1, 1, 0, 0, 0, 0, 0, true},
       {kUTC, 1970, 1, 1, 23, 59, 59, 999999, 0, true},
       {kUTC, 1970, 1, 1, kMaxShort, kMaxShort, kMaxShort, kMaxInt, -32768, true},
@@ -233,7 +233,7 @@ TEST_F(TCIMDateTimeTest, TimestampIsValidWhereMktimeGivesAnythingButMinusOne) {
   }
 }
 
-// Validation spares itself mktime for most times; it must not be seen from outside.
+// Validation avoids mktime for most times; the result must be the same as with mktime.
 TEST_F(TCIMDateTimeTest, ValidationAgreesWithMktimeInEveryZone) {
   std::mt19937 random(20070315);
   auto const pick = [&](int from, int to) { return std::uniform_int_distribution<int>(from, to)(random); };
@@ -306,7 +306,7 @@ TEST_F(TCIMDateTimeTest, ReadsAnInterval) {
   EXPECT_EQ(interval.GetMicroSeconds(), 42u);
 }
 
-TEST_F(TCIMDateTimeTest, PrintsWhatItHasRead) {
+TEST_F(TCIMDateTimeTest, PrintsTheTextThatItRead) {
   struct TRow {
     char const* text;
     char const* printed;
@@ -326,7 +326,7 @@ TEST_F(TCIMDateTimeTest, PrintsWhatItHasRead) {
       {"00000001020304.000005:000", "00000001020304.000005:000"},
       {"00000000000000.000000:000", "00000000000000.000000:000"},
       {"99999999235959.999999:000", "99999999235959.999999:000"},
-      // The place of the point is not examined, nor are the digits behind the colon.
+      // The character at the point's position is not checked, nor are the digits after the colon.
       {"20070315143000x000000+060", "20070315143000.000000+060"},
       {"200703151430000000000+060", "20070315143000.000000+060"},
       {"00000001020304:000005:000", "00000001020304.000005:000"},
@@ -358,7 +358,7 @@ TEST_F(TCIMDateTimeTest, RefusesMalformedTextAndKeepsTheOldValue) {
       std::string(25, '\0'),
       std::string(25, '0'),
       std::string(100000, '0'),
-      "00000001240000.000000:000",  // well-formed, but no valid interval
+      "00000001240000.000000:000",  // well-formed, but not a valid interval
       "00000001250000.000000:000",
       "00000001006000.000000:000",
       "00000001000060.000000:000",
@@ -378,7 +378,7 @@ TEST_F(TCIMDateTimeTest, RefusesMalformedTextAndKeepsTheOldValue) {
   }
 }
 
-TEST_F(TCIMDateTimeTest, WantsADigitAtEveryPlaceButThePointAndTheSign) {
+TEST_F(TCIMDateTimeTest, RequiresADigitAtEveryPositionExceptThePointAndTheSign) {
   for (std::string const good : {"20070315143000.000000+060", "00000001020304.000005:000"})
     for (std::size_t at = 0; at < good.size(); ++at) {
       if (at == 14 || at == 21) continue;
@@ -393,19 +393,19 @@ TEST_F(TCIMDateTimeTest, WantsADigitAtEveryPlaceButThePointAndTheSign) {
 
 // ---- Text ----
 
-TEST_F(TCIMDateTimeTest, PrintsTimestampsFilledWithZeros) {
+TEST_F(TCIMDateTimeTest, PrintsTimestampsPaddedWithZeros) {
   EXPECT_EQ(TCIMDateTime(2007, 3, 15, 14, 30, 0, 0, 60).ToString(), "20070315143000.000000+060");
   EXPECT_EQ(TCIMDateTime(2007, 3, 15, 14, 30, 0, 0, -300).ToString(), "20070315143000.000000-300");
   EXPECT_EQ(TCIMDateTime(2007, 3, 15, 14, 30, 0, 0, 0).ToString(), "20070315143000.000000+000");
   EXPECT_EQ(TCIMDateTime(7, 1, 2, 3, 4, 5, 6, -7).ToString(), "00070102030405.000006-007");
 }
 
-TEST_F(TCIMDateTimeTest, PrintsIntervalsFilledWithZeros) {
+TEST_F(TCIMDateTimeTest, PrintsIntervalsPaddedWithZeros) {
   EXPECT_EQ(TCIMDateTime(1, 2, 3, 4, 5).ToString(), "00000001020304.000005:000");
   EXPECT_EQ(TCIMDateTime(0, 0, 0, 0, 0).ToString(), "00000000000000.000000:000");
 }
 
-TEST_F(TCIMDateTimeTest, PrintsNumbersWiderThanTheirPlaceWhole) {
+TEST_F(TCIMDateTimeTest, PrintsEveryDigitOfATooWideNumber) {
   EXPECT_EQ(TCIMDateTime(4294967295u, 1, 2, 3, 4).ToString(), "4294967295010203.000004:000");
   EXPECT_EQ(TCIMDateTime(10000, 100, 101, 102, 103, 104, 1000000, 1000).ToString(), "10000100101102103104.1000000+1000");
   EXPECT_EQ(TCIMDateTime(65535, 65535, 4294967295u, 65535, 65535, 65535, 4294967295u, -32768).ToString(),
@@ -416,7 +416,7 @@ TEST_F(TCIMDateTimeTest, PrintsLikePrintf) {
   std::mt19937 random(20070315);
   auto const pick = [&](unsigned int to) { return std::uniform_int_distribution<unsigned int>(0, to)(random); };
   for (int round = 0; round < 20000; ++round) {
-    unsigned int const wide = round % 4 == 0 ? 650 : 1;  // now and then numbers wider than their place
+    unsigned int const wide = round % 4 == 0 ? 650 : 1;  // sometimes numbers with too many digits
     unsigned int const year = 1972 + pick(8027), month = pick(99 * wide), day = pick(99 * wide), hour = pick(99 * wide);
     unsigned int const minute = pick(99 * wide), second = pick(99 * wide), microSeconds = pick(999999 * wide);
     int const offset = static_cast<int>(pick(1998)) - 999;
@@ -503,7 +503,7 @@ TEST_F(TCIMDateTimeTest, ComparesTimestampsByInstantAndThenMicroseconds) {
       {kUTC, "19600101000000.000000+000", "19700101000000.000000+000", -1},
       {kBerlin, "20070715143000.000000+120", "20070715123000.000000+000", 0},
       {kBerlin, "20070325013000.000000+060", "20070325023000.000000+120", 0},
-      // The epoch's date counts as the epoch only where mktime gives -1.
+      // The epoch date counts as the epoch only when mktime returns -1.
       {kEastHour, "19700101005959.000000+000", "19700101010000.000000+000", 0},
       {kEastHour, "19700101005958.000000+000", "19700101005959.000000+000", -1},
       {kEastHour, "19700101000000.000000+000", "19700101010000.000000+000", -1},
@@ -542,7 +542,7 @@ TEST_F(TCIMDateTimeTest, ComparesIntervalsByLengthAndThenMicroseconds) {
   EXPECT_TRUE(TCIMDateTime(4294967294u, 23, 59, 59, 0) < TCIMDateTime(4294967295u, 0, 0, 0, 0));
 }
 
-TEST_F(TCIMDateTimeTest, TimestampAndIntervalDoNotCompare) {
+TEST_F(TCIMDateTimeTest, ComparingATimestampWithAnIntervalThrows) {
   TCIMDateTime const timestamp = At("20070315143000.000000+060"), interval = At("00000001000000.000000:000");
   EXPECT_STATUS(void(timestamp == interval), kZEPStatusInvalidDateTime);
   EXPECT_STATUS(void(interval == timestamp), kZEPStatusInvalidDateTime);
@@ -550,8 +550,8 @@ TEST_F(TCIMDateTimeTest, TimestampAndIntervalDoNotCompare) {
   EXPECT_STATUS(void(interval < timestamp), kZEPStatusInvalidDateTime);
 }
 
-// A timestamp that was valid in one zone need not be in another.
-TEST_F(TCIMDateTimeTest, InstantThatMktimeCannotTellFromFailureDoesNotCompareOrAdd) {
+// A timestamp that was valid in one zone may be invalid in another.
+TEST_F(TCIMDateTimeTest, AnInstantThatMktimeReportsAsMinusOneCannotBeComparedOrAdded) {
   TCIMDateTime const good = At("20070315143000.000000+060"), interval = At("00000001000000.000000:000");
   TCIMDateTime bad;
   {
@@ -617,10 +617,10 @@ TEST_F(TCIMDateTimeTest, DifferenceOfIntervalsHasNoSign) {
   for (TArithmeticRow const& row : rows) ExpectResult(row);
 }
 
-// A total of 64 bits has room for 106751991 days.
+// A 64-bit total has room for 106751991 days.
 TEST_F(TCIMDateTimeTest, TotalsOfIntervalsWrapAround) {
   EXPECT_EQ((TCIMDateTime(100000000, 0, 0, 0, 0) + TCIMDateTime(6751991, 0, 0, 0, 0)).ToString(), "106751991000000.000000:000");
-  // 200000000 days are 17280000000000000000 microseconds, 1166744073709551616 short of 2 to the power of 64.
+  // 200000000 days are 17280000000000000000 microseconds, which is 1166744073709551616 less than 2^64.
   EXPECT_EQ((TCIMDateTime(100000000, 0, 0, 0, 0) + TCIMDateTime(100000000, 0, 0, 0, 0)).ToString(), "13503982080149.551616:000");
   EXPECT_EQ((TCIMDateTime(200000000, 0, 0, 0, 0) - TCIMDateTime(0, 0, 0, 0, 0)).ToString(), "13503982080149.551616:000");
 }
@@ -636,7 +636,7 @@ TEST_F(TCIMDateTimeTest, AddsAnIntervalToATimestamp) {
       {kUTC, "20071332256175.000000+000", '+', "00000000000000.000000:000", "20080202020215.000000+000"},
       {kUTC, "19700101000000.000000+000", '+', "00000000000001.000000:000", "19700101000001.000000+000"},
       {kEastHour, "19700101020000.000000+060", '+', "00000000000001.000000:000", "19700101020001.000000+060"},
-      // In summer too the fields stay those of standard time.
+      // The fields are in standard time, in summer too.
       {kBerlin, "20070715143000.000000+060", '+', "00000000010000.000000:000", "20070715153000.000000+060"},
       {kBerlin, "20070115143000.000000+060", '+', "00000181000000.000000:000", "20070715143000.000000+060"},
       {kBerlin, "20070715143000.000000+060", '+', "00000184000000.000000:000", "20080115143000.000000+060"},
@@ -663,14 +663,14 @@ TEST_F(TCIMDateTimeTest, DifferenceOfTimestampsIsTheTimeBetweenTheirInstants) {
       {kUTC, "19700101000000.000000+000", '-', "19600101000000.000000+000", "00003653000000.000000:000"},
       {kUTC, "20240301000000.000000+000", '-', "20240201000000.000000+000", "00000029000000.000000:000"},
       {kBerlin, "20070715143000.000000+060", '-', "20070115143000.000000+060", "00000181000000.000000:000"},
-      // The epoch's date counts as the epoch where mktime gives -1.
+      // The epoch date counts as the epoch when mktime returns -1.
       {kEastHour, "19700101005959.000000+000", '-', "19700101010000.000000+000", "00000000000000.000000:000"},
       {kEastHour, "19700101005958.000000+000", '-', "19700101010000.000000+000", "00000000000002.000000:000"},
   };
   for (TArithmeticRow const& row : rows) ExpectResult(row);
 }
 
-TEST_F(TCIMDateTimeTest, TakesAnIntervalOffATimestamp) {
+TEST_F(TCIMDateTimeTest, SubtractsAnIntervalFromATimestamp) {
   TArithmeticRow const rows[] = {
       {kUTC, "20070316163304.000005+000", '-', "00000001020304.000005:000", "20070315143000.000000+000"},
       {kUTC, "20070315143000.000000-300", '-', "00000000003000.000000:000", "20070315140000.000000-300"},
@@ -695,9 +695,9 @@ TEST_F(TCIMDateTimeTest, IntervalMinusTimestampIsATimestampWithTheMicrosecondsCr
   for (TArithmeticRow const& row : rows) ExpectResult(row);
 }
 
-TEST_F(TCIMDateTimeTest, TimestampBehindItsIntervalLosesTheSignOfTheSecondsOnly) {
+TEST_F(TCIMDateTimeTest, TimestampMinusALongerIntervalLosesTheSignOfTheSecondsOnly) {
   TArithmeticRow const rows[] = {
-      // One hour before the epoch becomes one hour behind it.
+      // One hour before the epoch becomes one hour after it.
       {kUTC, "19700101010000.000000+000", '-', "00000000020000.000000:000", "19700101010000.000000+000"},
       {kUTC, "19700101010000.750000+000", '-', "00000000020000.250000:000", "19700101010000.500000+000"},
       {kUTC, "19700101010000.250000+000", '-', "00000000020000.750000:000", "19700101005959.500000+000"},
@@ -707,7 +707,7 @@ TEST_F(TCIMDateTimeTest, TimestampBehindItsIntervalLosesTheSignOfTheSecondsOnly)
   for (TArithmeticRow const& row : rows) ExpectResult(row);
 }
 
-TEST_F(TCIMDateTimeTest, TheEpochsDateCountsAsTheEpochWhereMktimeGivesMinusOne) {
+TEST_F(TCIMDateTimeTest, TheEpochDateCountsAsTheEpochWhenMktimeReturnsMinusOne) {
   TArithmeticRow const rows[] = {
       {kEastHour, "19700101005959.000000+000", '+', "00000000000010.000000:000", "19700101010010.000000+000"},
       {kEastHour, "00000000000010.000000:000", '+', "19700101005959.000000+000", "19700101010010.000000+000"},
@@ -718,7 +718,7 @@ TEST_F(TCIMDateTimeTest, TheEpochsDateCountsAsTheEpochWhereMktimeGivesMinusOne) 
   for (TArithmeticRow const& row : rows) ExpectResult(row);
 }
 
-TEST_F(TCIMDateTimeTest, AnIntervalLeavesTheFieldsOfATimestampAsTheyWere) {
+TEST_F(TCIMDateTimeTest, SettingAnIntervalKeepsTheFieldsOnlyATimestampHas) {
   TCIMDateTime value = At("20070315143000.000000+060");
   value.Set(1, 2, 3, 4, 5);
   EXPECT_EQ(value.ToString(), "00000001020304.000005:000");
@@ -727,11 +727,11 @@ TEST_F(TCIMDateTimeTest, AnIntervalLeavesTheFieldsOfATimestampAsTheyWere) {
   EXPECT_EQ(value.GetUTCOffset(), 60);
 }
 
-TEST_F(TCIMDateTimeTest, SumBeforeTheEpochComesOutAsFarBehindIt) {
+TEST_F(TCIMDateTimeTest, ASumBeforeTheEpochIsMirroredToAfterTheEpoch) {
   ExpectResult({kUTC, "19691231000000.000000+000", '+', "00000000010000.000000:000", "19700101230000.000000+000"});
 }
 
-// Seconds that cancel out leave a negative fraction, which is stored as it wraps around.
+// When the seconds cancel out, a negative fraction remains, which wraps around when it is stored.
 TEST_F(TCIMDateTimeTest, NegativeFractionOfASecondWrapsAround) {
   TCIMDateTime const timestamp = At("19700101010000.250000+000"), interval = At("00000000010000.750000:000");
   EXPECT_EQ((timestamp - interval).GetMicroSeconds(), 4294467296u);
@@ -740,13 +740,13 @@ TEST_F(TCIMDateTimeTest, NegativeFractionOfASecondWrapsAround) {
   EXPECT_EQ((At("19691231235958.250000+000") + At("00000000000000.000000:000")).ToString(), "19700101000001.4294217296+000");
 }
 
-// A result in daylight saving is taken back by an hour, whatever that leads to.
-TEST_F(TCIMDateTimeTest, ResultsInDaylightSavingAreTakenBackByAnHour) {
+// A result in daylight saving time is moved back by an hour, even if that gives a wrong time.
+TEST_F(TCIMDateTimeTest, ResultsInDaylightSavingAreMovedBackByAnHour) {
   TArithmeticRow const rows[] = {
-      // Into the first hour: an hour back it is winter again, where clocks read another hour less.
+      // A result in the first hour of summer time: an hour earlier is winter time, when clocks are another hour back.
       {kBerlin, "20070325013000.000000+060", '+', "00000000010000.000000:000", "20070325013000.000000+060"},
       {kBerlin, "20070325013000.000000+060", '+', "00000000020000.000000:000", "20070325033000.000000+060"},
-      // Where daylight saving is half an hour, half an hour is lost.
+      // Where summer time shifts by half an hour, half an hour is lost.
       {kLordHowe, "20070115143000.000000+630", '+', "00000000000000.000000:000", "20070115140000.000000+630"},
       {kLordHowe, "20070715143000.000000+630", '+', "00000000000000.000000:000", "20070715143000.000000+630"},
   };

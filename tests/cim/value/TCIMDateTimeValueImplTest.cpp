@@ -71,7 +71,7 @@ TEST_F(TCIMDateTimeValueImplTest, ComparesLikeTheDatetimes) {
   EXPECT_FALSE(data < TCIMValue(At("20070315142959.999999+060")));
 }
 
-TEST_F(TCIMDateTimeValueImplTest, NullOrAnotherKindOfDatetimeDoesNotCompare) {
+TEST_F(TCIMDateTimeValueImplTest, ComparingWithANullOrAnotherKindOfDatetimeThrows) {
   TCIMDateTimeValueImpl const data(At(kText));
   for (TCIMDateTime const& other : {TCIMDateTime(), TCIMDateTime(1, 0, 0, 0, 0)}) {
     EXPECT_STATUS(void(data == TCIMValue(other)), kZEPStatusInvalidDateTime);
@@ -95,7 +95,7 @@ TEST_F(TCIMDateTimeValueImplTest, IsNeitherEqualToNorLessThanAValueOfAnotherType
   }
 }
 
-// The same through the handle.
+// Through TCIMValue.
 
 TEST_F(TCIMDateTimeValueImplTest, ValueOfADatetimeReadsBackPrintsAndCompares) {
   TCIMValue const value(At(kText));

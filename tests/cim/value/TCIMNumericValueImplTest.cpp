@@ -30,7 +30,7 @@ using TNumbers = testing::Types<bool, unsigned char, signed char, unsigned short
                                 float, double>;
 TYPED_TEST_SUITE(TCIMNumericConversionTest, TNumbers, );
 
-// Reads the data as TAsked: its value when it is stored as exactly that, else a type mismatch.
+// Converts the data to TAsked: that gives its value when TAsked is exactly the stored type, and otherwise a type mismatch.
 template <class TAsked, class TStored, class TData>
 void ExpectReadAs(TData const& data, TStored stored) {
   if constexpr (std::is_same_v<TAsked, TStored>)
@@ -44,7 +44,7 @@ void ExpectReadAsEachOf(TImpl const& data, TStored stored, TList<TAsked...>) {
   (ExpectReadAs<TAsked>(data, stored), ...);
 }
 
-TYPED_TEST(TCIMNumericConversionTest, IsReadOnlyAsExactlyTheTypeItIsStoredAs) {
+TYPED_TEST(TCIMNumericConversionTest, ConvertsOnlyToExactlyTheStoredType) {
   for (TypeParam const number : {TLimits<TypeParam>::lowest(), TypeParam(0), TypeParam(1), TLimits<TypeParam>::max()}) {
     TImpl const data(number);
     ExpectReadAsEachOf(data, number, TNumbers());
@@ -57,8 +57,8 @@ TYPED_TEST(TCIMNumericConversionTest, IsReadOnlyAsExactlyTheTypeItIsStoredAs) {
   }
 }
 
-TYPED_TEST(TCIMNumericConversionTest, IsOneTagAndOneWord) {
-  EXPECT_EQ(sizeof(TImpl), sizeof(void*) + sizeof(void*) + 8);  // behind the pointer to the virtual table
+TYPED_TEST(TCIMNumericConversionTest, TheDataIsOneTagAndOneWord) {
+  EXPECT_EQ(sizeof(TImpl), sizeof(void*) + sizeof(void*) + 8);  // including the pointer to the virtual table
 }
 
 // ---- Text ----
@@ -143,8 +143,8 @@ TTextRow const kTexts[] = {
     {TImpl(0.00001), 10, "1e-05"},
     {TImpl(0.00099999995), 10, "0.001"},
     {TImpl(0.5), 10, "0.5"},
-    {TImpl(1.000005), 10, "1.00001"},  // what is stored lies above the tie
-    {TImpl(2.000005), 10, "2"},        // and here below it
+    {TImpl(1.000005), 10, "1.00001"},  // the stored number is above the tie
+    {TImpl(2.000005), 10, "2"},        // here it is below
     {TImpl(8388608.5), 10, "8.38861e+06"},
     {TImpl(1024.125), 10, "1024.12"},  // a tie goes to the even digit
     {TImpl(1024.375), 10, "1024.38"},
@@ -237,7 +237,7 @@ TEST(TCIMNumericValueImplTest, RealsPrintAsAStreamPrintsThem) {
   }
 }
 
-// Where the number of digits before the point changes, and where the binary exponent does.
+// Powers of 10, where the number of digits before the point changes, and of 2, where the binary exponent changes.
 TEST(TCIMNumericValueImplTest, PowersPrintAsAStreamPrintsThem) {
   for (int exponent = -330; exponent <= 310; ++exponent)
     for (double const power : {std::pow(10.0, exponent), std::ldexp(1.0, exponent)})
@@ -245,7 +245,7 @@ TEST(TCIMNumericValueImplTest, PowersPrintAsAStreamPrintsThem) {
         ASSERT_EQ(TImpl(near).ToString(10), StreamText(near)) << std::hexfloat << near;
 }
 
-// Numbers with few decimal digits: near them the sixth digit is decided by what is really stored.
+// Numbers with few decimal digits, near which the exact stored number decides the sixth digit.
 TEST(TCIMNumericValueImplTest, RealsNearATiePrintAsAStreamPrintsThem) {
   std::mt19937_64 random(1983);
   for (int i = 0; i < 100000; ++i) {
@@ -264,7 +264,7 @@ protected:
   std::string do_truename() const override { return "wahr"; }
 };
 
-TEST(TCIMNumericValueImplTest, TheProcessLocaleHasNoSay) {
+TEST(TCIMNumericValueImplTest, TheProcessLocaleHasNoEffect) {
   std::locale const old = std::locale::global(std::locale(std::locale::classic(), new TCommaPunctuation));
   EXPECT_EQ(TImpl(1234.5).ToString(10), "1234.5");
   EXPECT_EQ(TImpl(1234567u).ToString(10), "1234567");
@@ -302,7 +302,7 @@ TYPED_TEST(TCIMNumericConversionTest, IsNeitherEqualNorLessAcrossTypes) {
   EXPECT_FALSE(data == TCIMValue());
 }
 
-TYPED_TEST(TCIMNumericConversionTest, AgainstANullOfItsTypeThrowsValueIsNull) {
+TYPED_TEST(TCIMNumericConversionTest, ComparingWithANullOfItsTypeThrowsValueIsNull) {
   TCIMValue null(TypeParam(1));
   null.SetNullValue(null.GetType(), 0);
   EXPECT_STATUS((void)(TImpl(TypeParam(1)) == null), kZEPStatusValueIsNULL);
@@ -329,14 +329,14 @@ TEST(TCIMNumericValueImplTest, ANaNIsNeitherEqualNorLess) {
   EXPECT_FALSE(TImpl(-0.0) < TCIMValue(0.0));
 }
 
-// ---- Tags that no constructor gives ----
+// ---- Tags that no constructor sets ----
 
 class TMistaggedImpl : public TImpl {
 public:
   explicit TMistaggedImpl(int tag) : TImpl(1u) { fType = TType::ECIMType(tag); }
 };
 
-TEST(TCIMNumericValueImplTest, AForeignTagIsRefused) {
+TEST(TCIMNumericValueImplTest, ATagThatNoConstructorSetsIsRefused) {
   EXPECT_STATUS(TMistaggedImpl(12).ToString(10), kZEPStatusNotImplemented);
   EXPECT_STATUS(TMistaggedImpl(12).ToString(2), kZEPStatusNotSupported);
   EXPECT_STATUS((void)(TMistaggedImpl(12) == TCIMValue(TCIMChar16(1))), kZEPStatusNotImplemented);

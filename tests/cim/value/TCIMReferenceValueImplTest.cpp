@@ -28,13 +28,13 @@ protected:
   boost::shared_ptr<TFakeNamespace> const fNamespace = boost::make_shared<TFakeNamespace>();
 };
 
-TEST_F(TCIMReferenceValueImplTest, PrintsThePathWhateverTheRadix) {
+TEST_F(TCIMReferenceValueImplTest, PrintsThePathForAnyRadix) {
   TImpl const data(Disk(255));
   for (int radix : {0, 2, 8, 10, 16}) EXPECT_EQ(data.ToString(static_cast<unsigned char>(radix)), "X_Disk.Id=\"255\"") << radix;
   EXPECT_EQ(TImpl(data).ToString(10), "X_Disk.Id=\"255\"");
 }
 
-TEST_F(TCIMReferenceValueImplTest, HandsOutACopyOfTheReference) {
+TEST_F(TCIMReferenceValueImplTest, ConvertsToACopyOfTheReference) {
   TImpl const data(Disk(5));
   TCIMReference copy = data;
   EXPECT_TRUE(copy == Disk(5));
@@ -91,7 +91,7 @@ TEST_F(TCIMReferenceValueImplTest, IsNeitherEqualNorLessAcrossTypes) {
   }
 }
 
-TEST_F(TCIMReferenceValueImplTest, AgainstANullReferenceThrowsValueIsNull) {
+TEST_F(TCIMReferenceValueImplTest, ComparingWithANullReferenceThrowsValueIsNull) {
   TCIMValue const null(TType::kCIMTypeReference, 0);
   EXPECT_STATUS((void)(TImpl(Disk(5)) == null), kZEPStatusValueIsNULL);
   EXPECT_STATUS((void)(TImpl(Disk(5)) < null), kZEPStatusValueIsNULL);

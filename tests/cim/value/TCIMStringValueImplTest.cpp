@@ -10,7 +10,7 @@ using TImpl = TCIMStringValueImpl;
 
 std::string const kWithZero("a\0b", 3);
 
-TEST(TCIMStringValueImplTest, GivesItsTextBackUnchanged) {
+TEST(TCIMStringValueImplTest, ReturnsItsTextUnchanged) {
   for (std::string const& text : {std::string(), std::string("  a \"b\" \\ \n"), std::string("\xFF\x80"), kWithZero}) {
     TImpl const data(text);
     EXPECT_EQ(data.operator std::string(), text);
@@ -61,7 +61,7 @@ TEST(TCIMStringValueImplTest, IsNeitherEqualNorLessAcrossTypes) {
   }
 }
 
-TEST(TCIMStringValueImplTest, AgainstANullStringThrowsValueIsNull) {
+TEST(TCIMStringValueImplTest, ComparingWithANullStringThrowsValueIsNull) {
   TCIMValue const null(TCIMValue::TCIMType::kCIMTypeString, 0);
   EXPECT_STATUS((void)(TImpl("a") == null), kZEPStatusValueIsNULL);
   EXPECT_STATUS((void)(TImpl("a") < null), kZEPStatusValueIsNULL);

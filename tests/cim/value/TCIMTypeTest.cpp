@@ -64,7 +64,7 @@ TEST(TCIMTypeTest, ATagWithoutNameThrowsTypeMismatch) {
   }
 }
 
-TEST(TCIMTypeTest, AStreamTakesTheName) {
+TEST(TCIMTypeTest, StreamingWritesTheName) {
   std::ostringstream stream;
   stream << TType(TType::kCIMTypeSint32) << ' ' << ArrayOf(TType::kCIMTypeString);
   EXPECT_EQ(stream.str(), "sint32 string");

@@ -9,7 +9,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-// A kind that can do nothing but print.
+// A kind that supports printing only.
 class TMuteImpl : public TCIMValueImpl {
 public:
   std::string ToString(unsigned char) const override { return "mute"; }
@@ -37,7 +37,7 @@ TEST(TCIMValueImplTest, TheBaseRefusesEveryConversion) {
   EXPECT_STATUS(data.operator std::vector<TCIMValue>&(), kZEPStatusTypeMismatch);
 }
 
-// Plug-ins are compiled against this order. The two destructors are 1 and 2.
+// Plug-ins are compiled against this order. The two destructors have the slots 1 and 2.
 TEST(TCIMValueImplTest, VirtualOperationsKeepTheirSlots) {
   EXPECT_EQ(SlotOf(&TCIMValueImpl::operator bool), 3u);
   EXPECT_EQ(SlotOf(&TCIMValueImpl::operator unsigned char), 4u);

@@ -36,7 +36,7 @@ TCIMValue ReferenceTo(boost::shared_ptr<ICIMClass> cls) {
   return TCIMValue(reference);
 }
 
-// The whole state of a value, for comparing before and after.
+// The complete state of a value, to compare it before and after an operation.
 struct TState {
   explicit TState(TCIMValue const& value)
       : fType(value.GetType()),
@@ -84,7 +84,7 @@ TEST(TCIMValueTest, ATypeAndASizeMakeANullArray) {
   EXPECT_EQ(value.GetType().ToString(), "string");
 }
 
-TEST(TCIMValueTest, ATypeWithoutSizeStaysAsItIs) {
+TEST(TCIMValueTest, ATypeWithoutASizeIsNotChanged) {
   TCIMValue const scalar(TType::kCIMTypeUint32, 0);
   EXPECT_TRUE(scalar.IsNull());
   EXPECT_FALSE(scalar.IsArray());
@@ -133,7 +133,7 @@ struct TKindRow {
   char const* name;
   int tag;
   TCIMValue value;
-  std::function<void(TCIMValue&)> set;  // the setter of the same argument
+  std::function<void(TCIMValue&)> set;  // the setter with the same argument
   char const* text;
 };
 
@@ -166,7 +166,7 @@ std::vector<TKindRow> Kinds() {
 struct TConversionRow {
   char const* name;
   int tag;
-  std::function<bool(TCIMValue const&)> convert;  // whether the result is the one of the row in Kinds
+  std::function<bool(TCIMValue const&)> convert;  // whether the result is that of the row in Kinds
 };
 
 std::vector<TConversionRow> Conversions() {
@@ -190,7 +190,7 @@ std::vector<TConversionRow> Conversions() {
   };
 }
 
-TEST(TCIMValueTest, EachConstructorGivesItsTagAndItsData) {
+TEST(TCIMValueTest, EachConstructorSetsItsTagAndItsData) {
   for (auto const& row : Kinds()) {
     EXPECT_EQ(row.value.GetType(), row.tag) << row.name;
     EXPECT_FALSE(row.value.IsNull()) << row.name;
@@ -222,7 +222,7 @@ TEST(TCIMValueTest, ScalarSettersKeepReferencedClassAndSize) {
   }
 }
 
-TEST(TCIMValueTest, AReferenceBringsItsClass) {
+TEST(TCIMValueTest, SettingAReferenceSetsTheReferencedClass) {
   boost::shared_ptr<ICIMClass> const cls = NewClass();
   TCIMReference reference(nullptr, TCIMContext());
   reference.SetClass(cls);
@@ -254,7 +254,7 @@ TEST(TCIMValueTest, ConversionsAreStrict) {
     }
 }
 
-TEST(TCIMValueTest, ANullValueConvertsToNothingWhateverItsTag) {
+TEST(TCIMValueTest, ConvertingANullValueOfAnyTagThrows) {
   for (auto const& row : Kinds())
     for (auto const& conversion : Conversions()) {
       SCOPED_TRACE(std::string("NULL ") + row.name + " read as " + conversion.name);
@@ -262,21 +262,21 @@ TEST(TCIMValueTest, ANullValueConvertsToNothingWhateverItsTag) {
     }
 }
 
-TEST(TCIMValueTest, AnArrayOfATypeIsNotThatType) {
+TEST(TCIMValueTest, AnArrayDoesNotConvertToItsElementType) {
   TCIMValue const array(TType::kCIMTypeUint8, 0, {TCIMValue((unsigned char)1)});
   EXPECT_STATUS(array.operator unsigned char(), kZEPStatusTypeMismatch);
   TCIMValue const references(TType::kCIMTypeReference, 0, TElements());
   EXPECT_STATUS(references.operator TCIMReference(), kZEPStatusTypeMismatch);
 }
 
-TEST(TCIMValueTest, AnIntIsNotALong) {
+TEST(TCIMValueTest, AnIntDoesNotConvertToALong) {
   TCIMValue const value(5);
   int const asInt = value;
   EXPECT_EQ(asInt, 5);
   EXPECT_STATUS([[maybe_unused]] long const asLong = value, kZEPStatusTypeMismatch);
 }
 
-TEST(TCIMValueTest, ToStringHandsTheRadixOn) {
+TEST(TCIMValueTest, ToStringPassesTheRadixOn) {
   EXPECT_EQ(TCIMValue(255u).ToString(16), "000000FF");
   EXPECT_EQ(TCIMValue(8u).ToString(8), "10");
   EXPECT_EQ(TCIMValue(8u).ToString(10), "8");
@@ -285,7 +285,7 @@ TEST(TCIMValueTest, ToStringHandsTheRadixOn) {
   for (auto const& row : Kinds()) EXPECT_STATUS(NullOf(row.value.GetType()).ToString(), kZEPStatusValueIsNULL);
 }
 
-TEST(TCIMValueTest, OnlyANullValueTakesAReferencedClass) {
+TEST(TCIMValueTest, OnlyANullValueAcceptsAReferencedClass) {
   boost::shared_ptr<ICIMClass> const cls = NewClass();
   TCIMValue null;
   null.SetReferencedClass(cls);
@@ -310,7 +310,7 @@ TEST(TCIMValueTest, AnArrayHoldsACopyOfItsElements) {
   EXPECT_EQ(value.GetMaxArraySize(), 1u);  // never compared with the number of elements
 }
 
-TEST(TCIMValueTest, AnArrayTypeMayCarryItsFlagAlready) {
+TEST(TCIMValueTest, AnArrayTypeMayAlreadyHaveTheArrayFlag) {
   TCIMValue const value(ArrayOf(TType::kCIMTypeString), 0, {TCIMValue("a")});
   EXPECT_EQ(value.GetType(), 29);
   EXPECT_EQ(value.ToString(), "{ a }");
@@ -378,13 +378,13 @@ TEST(TCIMValueTest, TheWrongElementIsWrittenToTheLogAsAnError) {
   TRootObject::GetCoreLogger()->ClearLog();
 }
 
-TEST(TCIMValueTest, AWrongElementWithoutTypeNameIsATypeMismatchAndNotLogged) {
+TEST(TCIMValueTest, AWrongElementWithoutATypeNameThrowsTypeMismatchUnlogged) {
   TRootObject::GetCoreLogger()->ClearLog();
   EXPECT_STATUS(TCIMValue(TType::kCIMTypeUint8, 0, {TCIMValue()}), kZEPStatusTypeMismatch);
   EXPECT_STATUS(TCIMValue(TType::kCIMTypeInvalid, 0, {TCIMValue("a")}), kZEPStatusTypeMismatch);
   EXPECT_TRUE(LoggedMessages().empty());
 
-  // The tags agree, so nothing is looked up.
+  // The tags are equal, so no type name is needed.
   EXPECT_EQ(TCIMValue(TType::kCIMTypeInvalid, 0, {TCIMValue()}).GetType(), TType::kCIMTypeArrayFlag);
 }
 
@@ -458,7 +458,7 @@ TEST(TCIMValueTest, ComparesByNullThenTagThenData) {
     EXPECT_EQ(row.a == row.b, row.equal) << row.what;
     EXPECT_EQ(row.b == row.a, row.equal) << row.what;
     EXPECT_EQ(row.a != row.b, !row.equal) << row.what;
-    if (row.equal && row.a.IsArray() && !row.a.IsNull()) continue;  // two arrays have no order
+    if (row.equal && row.a.IsArray() && !row.a.IsNull()) continue;  // arrays have no order
     EXPECT_EQ(row.a < row.b, row.less) << row.what;
     EXPECT_EQ(row.a >= row.b, !row.less) << row.what;
     EXPECT_EQ(row.a <= row.b, row.equal || row.less) << row.what;
@@ -476,8 +476,8 @@ TEST(TCIMValueTest, EveryKindSortsByItsTag) {
     }
 }
 
-// The derived comparisons follow from == and <, also where these are odd.
-TEST(TCIMValueTest, ANaNIsGreaterOrEqualAndGreater) {
+// The other comparisons are derived from == and <, which are both false for a NaN.
+TEST(TCIMValueTest, ANaNComparesAsGreater) {
   TCIMValue const nan(kNaN), one(1.0);
   EXPECT_FALSE(nan == nan);
   EXPECT_TRUE(nan != nan);
@@ -559,7 +559,7 @@ TEST(TCIMValueTest, ANullIsCopiedWithItsTag) {
     }
 }
 
-TEST(TCIMValueTest, TheReferencedClassIsTakenForAReferenceOnly) {
+TEST(TCIMValueTest, OnlyAReferenceTakesOverTheReferencedClass) {
   boost::shared_ptr<ICIMClass> const cls = NewClass();
   for (auto const& [way, name] : kWays) {
     SCOPED_TRACE(name);
@@ -576,7 +576,7 @@ TEST(TCIMValueTest, TheReferencedClassIsTakenForAReferenceOnly) {
   }
 }
 
-TEST(TCIMValueTest, TheMaximumSizeIsTakenForAnArrayOnly) {
+TEST(TCIMValueTest, OnlyAnArrayTakesOverTheMaximumSize) {
   for (auto const& [way, name] : kWays) {
     SCOPED_TRACE(name);
     EXPECT_EQ(Transferred(way, TCIMValue(TType::kCIMTypeString, 4)).GetMaxArraySize(), 4u);
@@ -641,7 +641,7 @@ TEST(TCIMValueTest, AssignmentFromItselfKeepsTheValue) {
     value = std::move(itself);
     EXPECT_EQ(TState(value), TState(row.value)) << row.name;
   }
-  // A NaN is not equal to itself, so it is really copied.
+  // A NaN is not equal to itself, so assignment copies it.
   TCIMValue nan(kNaN);
   TCIMValue& itself = nan;
   nan = itself;
@@ -675,7 +675,7 @@ TEST(TCIMValueTest, AValueMayBeAssignedFromOneOfItsElements) {
   TRootObject::GetCoreLogger()->ClearLog();
 }
 
-TEST(TCIMValueTest, AReferenceMayBeTakenFromAnElement) {
+TEST(TCIMValueTest, AReferenceMayBeMovedFromAnElement) {
   boost::shared_ptr<ICIMClass> const cls = NewClass();
   TCIMValue value(TType::kCIMTypeReference, 0, {ReferenceTo(cls)});
   value = std::move(ElementsOf(value)[0]);
@@ -698,7 +698,7 @@ TEST(TCIMValueTest, AMovedValueIsInTheDefaultState) {
   }
 }
 
-TEST(TCIMValueTest, MovingKeepsTheDataWhereItIs) {
+TEST(TCIMValueTest, MovingDoesNotCopyTheElements) {
   TCIMValue array(TType::kCIMTypeString, 0, {TCIMValue("a")});
   TElements const* const elements = &ElementsOf(array);
   TCIMValue moved(std::move(array));

@@ -1,4 +1,4 @@
-// Values read from text.
+// Reading values from text.
 
 #include "TCIMReference.h"
 #include "TCIMValue.h"
@@ -122,7 +122,7 @@ constexpr TReadRow kReads[] = {
     {TType::kCIMTypeReal64, "1,5", "1"},
     {TType::kCIMTypeReal64, ".", "0"},
     {TType::kCIMTypeReal64, "e5", "0"},
-    {TType::kCIMTypeReal64, "1e", "0"},  // the exponent has been taken and is missing
+    {TType::kCIMTypeReal64, "1e", "0"},  // an exponent without digits
     {TType::kCIMTypeReal64, "1e+", "0"},
     {TType::kCIMTypeReal64, "1ex", "0"},
     {TType::kCIMTypeReal64, "inf", "0"},
@@ -154,7 +154,7 @@ TEST(TCIMValueTextTest, AZeroByteEndsANumber) {
   EXPECT_EQ(Parse(TType::kCIMTypeUint32, std::string("\0004", 2)).ToString(), "0");
 }
 
-// What a stream reads, 0 where it fails.
+// The number that a stream reads; 0 when the stream fails.
 template <class TNumber>
 TNumber Extracted(std::string const& text) {
   std::istringstream stream(text);
@@ -164,7 +164,7 @@ TNumber Extracted(std::string const& text) {
   return stream ? number : TNumber{};
 }
 
-// Compares the bits, so that 0 and -0 are told apart.
+// Compares the bits, which distinguishes 0 from -0.
 template <class TStored, class TRead = TStored>
 testing::AssertionResult ReadsAsAStream(TType type, std::string const& text) {
   auto const expected = static_cast<TStored>(Extracted<TRead>(text));
@@ -187,7 +187,7 @@ testing::AssertionResult EveryTypeReadsAsAStream(std::string const& text) {
   return testing::AssertionSuccess();
 }
 
-TEST(TCIMValueTextTest, AGeneratedCorpusReadsAsAStreamReadsIt) {
+TEST(TCIMValueTextTest, GeneratedTextsAreReadAsAStreamReadsThem) {
   int count = 0;
   for (char const* blanks : {"", "\t\n\v\f\r ", "\xA0"})
     for (char const* sign : {"", "+", "-", "+-"})
@@ -243,7 +243,7 @@ std::string RandomText(std::mt19937_64& random, std::string const& alphabet, std
   return text;
 }
 
-TEST(TCIMValueTextTest, RandomTextReadsAsAStreamReadsIt) {
+TEST(TCIMValueTextTest, RandomTextIsReadAsAStreamReadsIt) {
   std::mt19937_64 random(20070315);
   for (int i = 0; i < 20000; ++i) {
     ASSERT_TRUE(EveryTypeReadsAsAStream(RandomText(random, "", 12)));
@@ -254,8 +254,8 @@ TEST(TCIMValueTextTest, RandomTextReadsAsAStreamReadsIt) {
   }
 }
 
-// Halfway between two neighbours, where the last digit read decides.
-TEST(TCIMValueTextTest, RealsOfManyDigitsReadAsAStreamReadsThem) {
+// Numbers halfway between two neighbouring reals, where the last digit decides.
+TEST(TCIMValueTextTest, RealsOfManyDigitsAreReadAsAStreamReadsThem) {
   std::mt19937_64 random(1983);
   for (int i = 0; i < 20000; ++i) {
     std::uint64_t const bits = random();
@@ -277,7 +277,7 @@ protected:
   std::string do_truename() const override { return "wahr"; }
 };
 
-TEST(TCIMValueTextTest, TheProcessLocaleHasNoSay) {
+TEST(TCIMValueTextTest, TheProcessLocaleHasNoEffect) {
   std::locale const old = std::locale::global(std::locale(std::locale::classic(), new TCommaPunctuation));
   EXPECT_EQ(Parse(TType::kCIMTypeReal64, "1.5").ToString(), "1.5");
   EXPECT_EQ(Parse(TType::kCIMTypeReal64, "-1e-400").ToString(), "-0");
@@ -288,7 +288,7 @@ TEST(TCIMValueTextTest, TheProcessLocaleHasNoSay) {
 
 // ---- The other types ----
 
-TEST(TCIMValueTextTest, AStringIsTheWholeText) {
+TEST(TCIMValueTextTest, AStringIsTheCompleteText) {
   for (std::string const& text : {std::string("  leading and trailing  "), std::string(), std::string("a\0b", 3)})
     EXPECT_EQ(Parse(TType::kCIMTypeString, text).operator std::string(), text);
 }
@@ -304,7 +304,7 @@ TEST(TCIMValueTextTest, Char16FromTextHoldsANullCharacter) {
   }
 }
 
-TEST(TCIMValueTextTest, ADateTimeIsItsText) {
+TEST(TCIMValueTextTest, ADateTimeIsReadFromItsText) {
   for (char const* text : {"20070315143000.000000+060", "00000002030405.000006:000"})
     EXPECT_EQ(Parse(TType::kCIMTypeDateTime, text).ToString(), text);
   EXPECT_STATUS(Parse(TType::kCIMTypeDateTime, "2007"), kZEPStatusInvalidDateTime);
@@ -312,7 +312,7 @@ TEST(TCIMValueTextTest, ADateTimeIsItsText) {
   EXPECT_STATUS(Parse(TType::kCIMTypeDateTime, " 20070315143000.000000+060"), kZEPStatusInvalidDateTime);
 }
 
-TEST(TCIMValueTextTest, AReferenceIsAPathInTheNamespace) {
+TEST(TCIMValueTextTest, AReferenceIsReadAsAPathInTheNamespace) {
   auto const ns = boost::make_shared<TFakeNamespace>();
   ns->Add("X_Disk").Add("Id", TType::kCIMTypeUint32);
   TCIMValue const value = Parse(TType::kCIMTypeReference, "ns:X_Disk.Id=\"5\"", ns);
@@ -331,14 +331,14 @@ TEST(TCIMValueTextTest, AMalformedReferenceThrowsWhatItsParserThrows) {
   TRootObject::GetCoreLogger()->ClearLog();
 }
 
-TEST(TCIMValueTextTest, NothingElseIsReadFromText) {
+TEST(TCIMValueTextTest, OtherTypesAreNotReadFromText) {
   for (int tag : {0, 16, 17, 18, 29, 31, 32, 33, -1}) {
     SCOPED_TRACE(tag);
     EXPECT_STATUS(Parse(TType::ECIMType(tag), "1"), kZEPStatusTypeMismatch);
   }
 }
 
-TEST(TCIMValueTextTest, TheTextIsNotModifiedAndTheRestIsDefault) {
+TEST(TCIMValueTextTest, TheTextIsNotModifiedAndOtherFieldsAreDefault) {
   std::string text = "  42abc";
   TCIMValue const value(TType::kCIMTypeUint32, text, nullptr);
   EXPECT_EQ(text, "  42abc");

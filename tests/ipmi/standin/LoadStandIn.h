@@ -6,8 +6,8 @@
 
 namespace NQRVZEP20 {
 
-// Loads the stand-in for libipmiClient.so ("whole", "without-open", ...) before the library looks for the real one, which
-// then gets this. For the rest of the process. Its calls are in the log and begin with "> ".
+// Loads a stand-in for libipmiClient.so ("whole", "without-open", ...). The core library then uses it instead of the real
+// one, for the rest of the process. Log lines that begin with "> " record the calls of the stand-in.
 inline TStandInIpmiClient& LoadStandInIpmiClient(std::string const& variant = "whole") {
   std::string const path = ZEP_IPMI_STANDINS "/" + variant + "/libipmiClient.so";
   void* const library = ::dlopen(path.c_str(), RTLD_NOW);

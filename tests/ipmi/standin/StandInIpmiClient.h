@@ -3,13 +3,13 @@
 #include <functional>
 #include <string>
 
-// The stand-in for libipmiClient.so: writes each call into the log, between the library's own lines, and does what it is
-// told.
+// The settings of the stand-in for libipmiClient.so, which logs each call, between the library's own lines, and behaves as
+// set here.
 struct TStandInIpmiClient {
   int openResult = 0;
   int sendResult = 0;
-  std::string response;          // what SendIpmiCommand writes
-  int responseLength = -1;       // what it says that it wrote; -1: the truth
+  std::string response;          // the response that SendIpmiCommand writes
+  int responseLength = -1;       // the length that it reports; -1: the true one
   int thrownByOpen = 0;          // an integer that OpenConnection throws; 0: none
   std::function<void()> atOpen;  // called by OpenConnection
 };

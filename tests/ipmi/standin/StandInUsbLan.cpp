@@ -1,8 +1,8 @@
-// A stand-in for ovdusblan.so: writes each call into the log and does what the environment says.
+// A stand-in for ovdusblan.so, which logs each call and is controlled by environment variables:
 //
-//   STANDIN_NODES    how many nodes there are
+//   STANDIN_NODES    the number of nodes
 //   STANDIN_UP       the nodes that are up, as digits
-//   STANDIN_THROWS   the function that throws, and what: "GetNodes int", "BringupOvdLan text"
+//   STANDIN_THROWS   the function that throws, and what it throws: "GetNodes int", "BringupOvdLan text"
 
 #include "ILogger.h"
 #include "TRootObject.h"
@@ -47,14 +47,14 @@ int GetNodes() {
 int QueryOvdLanState(int node) {
   Called("QueryOvdLanState", std::to_string(node));
   if (Variable("STANDIN_UP").find(std::to_string(node)) != std::string::npos) return 1;
-  return node % 2 == 0 ? 0 : 2;  // neither is 1
+  return node % 2 == 0 ? 0 : 2;  // neither means up
 }
 #endif
 
 #ifndef STANDIN_WITHOUT_BRINGUP
 int BringupOvdLan(int node) {
   Called("BringupOvdLan", std::to_string(node));
-  return 5;  // nobody asks
+  return 5;  // ignored by the caller
 }
 #endif
 
