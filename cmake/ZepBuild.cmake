@@ -40,6 +40,15 @@ if(ZEP_SANITIZE)
   endif()
 endif()
 
+# Hardening. The sanitizers bring checks of their own, and replace the functions that _FORTIFY_SOURCE checks.
+if(NOT ZEP_SANITIZE)
+  include(CheckPIESupported)
+  check_pie_supported(LANGUAGES CXX)
+  target_compile_options(zep_options INTERFACE -fstack-protector-strong -fstack-clash-protection -fcf-protection=full
+                                               $<$<NOT:$<CONFIG:Debug>>:-U_FORTIFY_SOURCE -D_FORTIFY_SOURCE=2>)
+  add_link_options(LINKER:-z,relro LINKER:-z,now)
+endif()
+
 if(ZEP_BUILD_FUZZ)
   # Lets the fuzzer see which branches of the library an input takes, not only those of the target itself.
   target_compile_options(zep_options INTERFACE -fsanitize=fuzzer-no-link)
