@@ -8,13 +8,15 @@
  * It holds at most one session, which belongs to the whole process: use it from one thread at a time.
  *
  * Answers may take 3 s, and packets may be lost, doubled and overtaken by others on the way. A request that gets no answer is
- * sent again: the first query of all every 0.5 s, the other steps of opening a session every second, a command every 3.5 s,
- * or a second later than the first query was answered if that is more. Every call blocks until it is done:
+ * sent again: the first query of all every 0.5 s, the other steps of opening a session after 3.5 s and then every second, a
+ * command every 3.5 s. When the first query took longer to be answered, each later wait is at least a second longer than
+ * that. Every call blocks until it is done:
  *
- *   OpenConnection   as long as the system looks for the host's address; then at most 60 s. A silent host is given up after
- *                    7 s, one that says that nobody listens at once
- *   SendIpmiCommand  at most 30 s; a silent controller is given up after 21 s. Where the session is opened anew before, the
- *                    times of CloseConnection and OpenConnection as well
+ *   OpenConnection   the time that the system needs to find the host's address, then at most 60 s. A silent address is given
+ *                    up after 7 s, and the host's next one is tried; a closed port is given up immediately. If a session is
+ *                    open, the time of CloseConnection is added
+ *   SendIpmiCommand  at most 30 s; a silent controller is given up after 21 s. If the session has to be reopened first, the
+ *                    times of CloseConnection and OpenConnection are added
  *   CloseConnection  at most 1.5 s
  */
 
@@ -36,7 +38,7 @@ enum {
   kIpmiClientNoSession = 9,       /* nothing is open */
   kIpmiClientCompletionCode = 10, /* the controller answered that it did not carry the command out */
   kIpmiClientOutOfMemory = 11,
-  kIpmiClientFail = 12 /* anything else, such as answers that make no sense: the caller's own packets, say */
+  kIpmiClientFail = 12 /* anything else, such as answers that make no sense (an echo of the packets sent, for example) */
 };
 
 enum {

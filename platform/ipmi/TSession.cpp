@@ -58,14 +58,14 @@ TWaits TSession::Lengthened(TWaits const& waits) const {
   return lengthened;
 }
 
-// Finds the address at which the host's controller listens.
+// Finds the address at which the host's controller answers.
 TContact TSession::Reach(TClock::time_point deadline) {
   const std::vector<TAddress> addresses = AddressesOf(fTarget.host, fTarget.port);
   for (std::size_t n = 0;; ++n) try {
       fLink = std::make_unique<TLink>(addresses[n]);
       return MakeContact(*fLink, fTimes.contact, deadline);
     } catch (TFailure const& failure) {
-      const bool isDeadEnd = failure.status == kIpmiClientUnreachable || fLink->NobodyListens();
+      const bool isDeadEnd = failure.status == kIpmiClientUnreachable || failure.status == kIpmiClientNoAnswer;
       if (!isDeadEnd || n + 1 == addresses.size()) throw;
     }
 }
@@ -83,7 +83,7 @@ void TSession::Open() {
       fLastAnswer = TClock::now();
       return;
     } catch (TFailure const& failure) {
-      Close();
+      Close(deadline);
       way = WayAfter(way, failure.cause);
       if (way == kNumberOfWays) throw;
     }
@@ -97,10 +97,17 @@ TReply TSession::Send(unsigned char netFn, unsigned char command, TByteVector co
   if (reply.completionCode != IPMI_COMP_CODE_INSUFFICIENT_PRIVILEGE_LEVEL) return reply;
 
   // It was not carried out. A late copy of a packet that opened the session takes the privilege away with some controllers.
-  RaisePrivilege(*fLink, *fEnvelope, Lengthened(fTimes.step), deadline);
+  try {
+    RaisePrivilege(*fLink, *fEnvelope, Lengthened(fTimes.step), deadline);
+  } catch (TFailure const& failure) {
+    if (failure.status != kIpmiClientRefused) throw;
+    return reply;
+  }
   return AskInSession(netFn, command, request, deadline);
 } catch (TFailure const& failure) {
-  if (failure.status != kIpmiClientBadArgument) fEnvelope.reset();
+  if (failure.status == kIpmiClientBadArgument) throw;
+  if (failure.status != kIpmiClientNoAnswer) Close();  // a controller that answers has a session to give back
+  fEnvelope.reset();
   throw;
 }
 
@@ -113,12 +120,12 @@ TReply TSession::AskInSession(unsigned char netFn, unsigned char command, TByteV
 }
 
 // A controller that does not answer closes the session by itself after a while.
-void TSession::Close() noexcept try {
+void TSession::Close(TClock::time_point deadline) noexcept try {
   if (!fEnvelope) return;
   const std::unique_ptr<IEnvelope> envelope = std::move(fEnvelope);
   TFields request(tmpl_cmd_close_session_rq);
   Checked(::fill_cmd_close_session(envelope->SessionId(), nullptr, request.Object()));
-  Ask(*fLink, *envelope, MessageOf(IPMI_NET_FN_APP_RQ, fLink->NextSequence(), request), fTimes.close, TClock::time_point::max());
+  Ask(*fLink, *envelope, MessageOf(IPMI_NET_FN_APP_RQ, fLink->NextSequence(), request), fTimes.close, deadline);
 } catch (TFailure const&) {
 } catch (std::exception const&) {
 }

@@ -11,14 +11,15 @@ struct TTimes {
 
   // The later waits also last a second longer than the answer to the first query took.
   std::chrono::milliseconds beyondContact{1000};
-  TWaits step = TWaits(8, std::chrono::milliseconds(0));  // of the opening
-  TWaits command = TWaits(6, kLong);                      // a slow controller must not get it twice
+  // A step of the opening: the controller may calculate for long, and does so anew for each copy; then the answer was lost.
+  TWaits step = {kLong, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore};
+  TWaits command = TWaits(6, kLong);  // a slow controller must not get it twice
   TWaits close = TWaits(3, kOften);
 
   std::chrono::milliseconds wholeOpening{60000}, wholeCommand{30000};
   std::chrono::milliseconds idle{20000};  // well before a controller closes a session by itself
 
-  static constexpr std::chrono::milliseconds kOften{500}, kLong{3500};
+  static constexpr std::chrono::milliseconds kOften{500}, kOnceMore{1000}, kLong{3500};
 };
 
 // A session with a controller, as administrator. Closed when it goes out of scope. Its functions throw TFailure.
@@ -40,7 +41,7 @@ private:
   TWaits Lengthened(TWaits const& waits) const;
   TContact Reach(TClock::time_point deadline);
   TReply AskInSession(unsigned char netFn, unsigned char command, TByteVector const& request, TClock::time_point deadline);
-  void Close() noexcept;
+  void Close(TClock::time_point deadline = TClock::time_point::max()) noexcept;
 
   TTarget const fTarget;
   TTimes const fTimes;

@@ -8,6 +8,8 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <algorithm>
+
 namespace NQRVZEP20 {
 namespace {
 
@@ -94,6 +96,19 @@ TEST_F(SessionTest, AnIdleSessionThatTheControllerForgotIsRenewedToo) {
   EXPECT_EQ(Events(session), 1);
 }
 
+TEST_F(SessionTest, AControllerThatCalculatesForTwoSecondsIsNotAskedAgainMeanwhile) {
+  relay_.reset();
+  relay_.emplace(623, kControllersPort, [](TRelay::TDatagram const& datagram) {
+    constexpr unsigned char kProofOfPassword = 0x13;  // RAKP 2
+    bool const isSlow = datagram.isAnswer && datagram.bytes[4] == 6 && (datagram.bytes[5] & 0x3F) == kProofOfPassword;
+    return isSlow ? TRelay::TFate{2s} : TRelay::AtOnce();
+  });
+  ipmi::TSession session(Target());
+  session.Open();
+  auto const requests = RequestsAfter(0);
+  EXPECT_EQ(std::count(requests.begin(), requests.end(), "RAKP 1"), 1);
+}
+
 TEST_F(SessionTest, AMessageThatIsTooLongForVersion15IsRefusedAndTheSessionGoesOn) {
   relay_.reset();
   relay_.emplace(623, kControllersPort, [](TRelay::TDatagram& datagram) {
@@ -134,7 +149,7 @@ TEST(EnvelopeTest, BothCipherSuitesCarryAMessageAndNoDamagedOne) {
     EXPECT_EQ(reply.data, (ipmi::TByteVector{'d', 'a', 't', 'a'}));
     clients.Accept(reply);
     EXPECT_EQ(clients.Unpack(packet, reply), ipmi::EVerdict::kOther) << "a copy";
-    constexpr std::size_t kFirstSigned = 4;  // behind the header of RMCP
+    constexpr std::size_t kFirstSigned = 4;  // after the RMCP header
     for (std::size_t place = kFirstSigned; place < packet.size(); ++place) {
       ipmi::TPacket damaged = packet;
       damaged[place] ^= 1;
