@@ -32,7 +32,7 @@ check_imports() {
   local imports plain
   imports=$(nm --dynamic --undefined-only "$1" | sed 's/.* //; s/@.*//')
   grep -qx '__stack_chk_fail' <<<"$imports" || missing "$1" "no stack protector"
-  plain=$(grep -xE 'v?[sf]?printf|snprintf|v?syslog' <<<"$imports" | paste -sd' ') || true
+  plain=$(grep -xE 'v?[sf]?printf|snprintf' <<<"$imports" | paste -sd' ') || true
   [[ -z $plain ]] || missing "$1" "unchecked calls, which _FORTIFY_SOURCE would replace: $plain"
 }
 
