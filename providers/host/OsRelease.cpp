@@ -1,7 +1,6 @@
 #include "OsRelease.h"
 
 #include <fstream>
-#include <iterator>
 
 namespace NQRVZEP20 {
 
@@ -44,7 +43,10 @@ std::map<std::string, std::string> ParseOsRelease(std::string_view text) {
 TOsRelease TOsRelease::OfThisMachine() {
   for (char const* name : kFiles) {
     std::ifstream file(name, std::ios::binary);
-    if (file) return TOsRelease(name, std::string(std::istreambuf_iterator<char>(file), {}));
+    std::string text;
+    std::getline(file, text, '\0');
+    bool const isWhole = file.is_open() && !file.bad();
+    if (isWhole) return TOsRelease(name, text);
   }
   return TOsRelease("", "");
 }

@@ -43,6 +43,7 @@ struct TSettings {
   std::string fPath;
   std::vector<TSetting> fSettings;
   std::vector<TIgnoredLine> fIgnored;
+  bool fIsCut;  // a reading error came before the end
 };
 
 // Why the library passes a line over; empty when it does not. `lineOfKey` has the keys of the lines before.
@@ -62,7 +63,7 @@ bool IsReadByTheLibrary() { return TOSSpecific::FileExists(kFileName) && TOSSpec
 
 // Values are the library's own; the file is read a second time for what it does not tell: the lines.
 TSettings ReadSettings() {
-  TSettings settings{TOSSpecific::GetCurrentDir() + "/" + kFileName, {}, {}};
+  TSettings settings{TOSSpecific::GetCurrentDir() + "/" + kFileName, {}, {}, false};
   std::map<std::string, std::size_t> lineOfKey;
   std::ifstream file;
   if (IsReadByTheLibrary()) file.open(kFileName);
@@ -76,6 +77,7 @@ TSettings ReadSettings() {
     else
       settings.fIgnored.push_back({line, text, key, reason});
   }
+  settings.fIsCut = file.bad();
   for (std::string const& key : TConfig::GetInstance()->listKeys())
     settings.fSettings.push_back({key, TConfig::GetInstance()->getValue(key), lineOfKey[key]});
   return settings;
@@ -134,6 +136,7 @@ std::string WhyNothing(TArguments const& arguments, TSettings const& settings) {
   if (!TOSSpecific::FileExists(kFileName)) return "there is no " + settings.fPath;
   if (TOSSpecific::GetFileSize(kFileName) == 0) return settings.fPath + " is empty";
   if (!std::ifstream(kFileName)) return settings.fPath + " cannot be read";
+  if (settings.fIsCut) return settings.fPath + " cannot be read to its end, so that no setting of it is used";
   if (!arguments.fKey) return "no line of " + settings.fPath + " is a setting";
   return settings.fPath + " does not set \"" + *arguments.fKey + "\"";
 }

@@ -586,6 +586,18 @@ TEST_F(ZepTransferTest, NothingIsSentOfWhatCannotBeRead) {
   EXPECT_EQ(NamesIn(server_->Tree().Path()), std::vector<std::string>());
 }
 
+#ifdef FAILING_READ
+TEST_F(ZepTransferTest, AFileThatFailsHalfWayLeavesNothingOnTheServer) {
+  std::string const file = Local("f", std::string(300000, 'x'));
+  TProgramRun const run =
+      RunProgram("HOME=/nowhere NETRC= LD_PRELOAD=" FAILING_READ " ZEP_TEST_FAILING_BYTE=150000" +
+                 (" ZEP_TEST_FAILING_FILE=" + file + " " + kZep + "send " + file + " " + Url("f")) + " < /dev/null 2>&1");
+  EXPECT_EQ(run.exitCode, kNoInput) << run.output;
+  EXPECT_THAT(run.output, HasSubstr("Input/output error")) << run.output;
+  EXPECT_EQ(NamesIn(server_->Tree().Path()), std::vector<std::string>());
+}
+#endif
+
 TEST_F(ZepTransferTest, AnAtSignInAPathIsNoPassword) {
   std::string const file = Local("f", "text");
   EXPECT_EQ(Zep("send " + file + " " + Url("a@b")).exitCode, kComplete) << "behind a user";

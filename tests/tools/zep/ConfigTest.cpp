@@ -125,6 +125,20 @@ TEST_F(ConfigTest, APipeOfThatNameIsNotWaitedFor) {
   EXPECT_EQ(run.errors, "zep: " + File() + " is empty\n");
 }
 
+#ifdef FAILING_READ
+TEST_F(ConfigTest, AFileThatCannotBeReadToItsEndIsReportedAsSuch) {
+  std::string const text(100000, '#');
+  Write("a=1\n" + text);
+  TCall call;
+  call.arguments = {"config"};
+  call.directory = dir_.Path();
+  call.environment = {{"LD_PRELOAD", FAILING_READ}, {"ZEP_TEST_FAILING_FILE", File()}, {"ZEP_TEST_FAILING_BYTE", "50000"}};
+  TRun const run = zep_.Run(call);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors, "zep: " + File() + " cannot be read to its end, so that no setting of it is used\n");
+}
+#endif
+
 TEST_F(ConfigTest, TakesOneKeyOnly) { EXPECT_EQ(Run({"a", "b"}).status, 64); }
 
 }  // namespace
