@@ -21,7 +21,13 @@ std::string ProcessNumberOf(std::string const& line) {
   return line.substr(start, std::min(line.find_first_not_of("0123456789", start), line.size()) - start);
 }
 
-// What the process calls itself. There is none of the number 0, or of one with zeros before it, which "kill" understands.
+// Whether a process may have it, as /proc writes it. "kill" understands more: it ends process 7 for "007".
+bool IsPlainNumber(std::string const& number) {
+  constexpr std::size_t kMostDigits = 7;  // the kernel's largest is 4194304
+  return number.front() != '0' && number.size() <= kMostDigits;
+}
+
+// What the process calls itself; nothing where there is none of that number.
 std::optional<std::string> NameOfProcess(std::string const& number) {
   std::ifstream file("/proc/" + number + "/comm", std::ios::binary);
   if (!file) return std::nullopt;
@@ -42,23 +48,31 @@ std::vector<std::string> DhcpClientLines() {
 
 namespace {
 
-bool IsStillListed(std::string const& line) {
+// By its number: the rest of a forged line may change each time.
+bool IsStillListed(std::string const& number) {
   std::vector<std::string> const lines = DhcpClientLines();
-  return std::find(lines.begin(), lines.end(), line) != lines.end();
+  return std::any_of(lines.begin(), lines.end(), [&](std::string const& line) { return ProcessNumberOf(line) == number; });
+}
+
+// Why the process of that number is not to be ended; empty when it is, or when there is nothing to end.
+std::string WhyNotNumber(std::string const& number) {
+  if (number.empty()) return "";
+  if (!IsPlainNumber(number)) return number + " is not the number of a process";
+  std::optional<std::string> const name = NameOfProcess(number);
+  if (name) return name->find(kName) != name->npos ? "" : "process " + number + " is \"" + *name + "\"";
+  return IsStillListed(number) ? "there is no process " + number : "";  // else it has ended meanwhile
 }
 
 }  // namespace
 
 std::string WhyNotToBeEnded(std::vector<std::string> const& lines) {
   for (std::string const& line : lines) {
-    std::string const number = ProcessNumberOf(line);
-    if (number.empty()) continue;  // ends nothing
-    std::optional<std::string> const name = NameOfProcess(number);
-    if (name && name->find(kName) != name->npos) continue;
-    if (!name && !IsStillListed(line)) continue;  // it has ended meanwhile
-    std::string const truth = name ? "process " + number + " is \"" + *name + "\"" : "there is no process " + number;
-    return "the line \"" + line + "\" of \"ps -e\" is wrong: " + truth +
-           ". Nothing was ended; --no-stop leaves the DHCP clients alone";
+    std::string const why = WhyNotNumber(ProcessNumberOf(line));
+    if (why.empty()) continue;
+    return "the line \"" + line + "\" of \"ps -e\" is wrong: " + why +
+           ". Nothing was ended. Another process may forge the line by a line break in its name: compare \"ps -e\" with the "
+           "names "
+           "in /proc/PID/comm and end that process. --no-stop leaves the DHCP clients alone";
   }
   return "";
 }

@@ -173,8 +173,8 @@ std::string AsJson(TFindings const& findings) {
 
 // ---- The steps ----
 
-// False, with the clients left alone, when the user does not want it. Throws std::runtime_error when a process that is none would
-// be ended: the library looks for itself, but at the same list.
+// False, with the clients left alone, when the user does not want it. Throws std::runtime_error when a process that is not a DHCP
+// client would be ended: the library reads the same list again for itself.
 bool StopClients(bool isConfirmed) {
   std::vector<std::string> const clients = DhcpClientLines();
   TellWhatWillHappen(clients);
