@@ -98,11 +98,20 @@ private:
 struct TSource {
   TDescriptor fFile;
   TTransferState& fState;
+  unsigned fMark;  // of fState.fLeft
 };
+
+// libcurl's callback before a transfer whose connection is there. A libcurl before 7.80 has none; ReadSource has to do.
+int MarkBegun(void* context, char*, char*, int, int) {
+  TSource& source = *static_cast<TSource*>(context);
+  source.fState.fLeft |= source.fMark;
+  return CURL_PREREQFUNC_OK;
+}
 
 // libcurl's read callback.
 std::size_t ReadSource(char* bytes, std::size_t size, std::size_t count, void* context) {
   TSource& source = *static_cast<TSource*>(context);
+  source.fState.fLeft |= source.fMark;
   ssize_t got = -1;
   while ((got = ::read(source.fFile.Get(), bytes, size * count)) < 0 && errno == EINTR) continue;
   if (got < 0) {
@@ -149,11 +158,7 @@ public:
   std::string const& Name() const { return fName; }
   std::string Url() const { return UrlOf(fPlace); }
   std::string DirectoryUrl() const { return UrlOf(fDirectory); }
-  std::string UrlOfOther(std::string const& name) const {
-    TRemote other = fPlace;
-    other.fPath = fDirectory.fPath + EncodedName(name);
-    return UrlOf(other);
-  }
+  std::string UrlOfOther(std::string const& name) const { return UrlOf(Beside(fPlace, name)); }
 
   TCommands Renaming(std::string const& from, std::string const& to) const {
     if (IsSftp()) return {"rename " + SftpPath(from) + " " + SftpPath(to)};
@@ -176,20 +181,26 @@ private:
 
 class TUpload {
 public:
-  TUpload(TRemote const& place, std::string const& file, int cleanUpSeconds, TTransferState& state)
-      : fNames(place), fFile(file), fCleanUpSeconds(cleanUpSeconds), fState(state) {
+  TUpload(TRemote const& place, TUploadNames const& names, std::string const& file, int cleanUpSeconds, TTransferState& state)
+      : fNames(place), fOthers(names), fFile(file), fCleanUpSeconds(cleanUpSeconds), fState(state) {
     fConnection.Set(CURLOPT_FTP_CREATE_MISSING_DIRS, 1L);
   }
 
   void Run() {
     if (HasControlCharacter(fNames.Name())) return SendToThePlace();  // which libcurl refuses
-    std::string const temporary = TemporaryNameFor(fNames.Name());
-    CURLcode const code = Send(fNames.UrlOfOther(temporary), fNames.Renaming(temporary, fNames.Name()));
-    if (code == CURLE_OK) return;
-    if (code == CURLE_QUOTE_ERROR) return RenameOrSendAnew(temporary);
-    bool const isNameRefused = fState.fMoved == 0 && fState.fReadError == 0 && IsRefusal(code);
-    if (isNameRefused) return SendToThePlace();
-    GiveUp(code, temporary);
+    std::string const& temporary = fOthers.fTemporary;
+    CURLcode const code = Send(fNames.UrlOfOther(temporary), fNames.Renaming(temporary, fNames.Name()), kLeftTemporary);
+    if (code == CURLE_OK) return SetLeft(kLeftTemporary, false);
+    if (code == CURLE_QUOTE_ERROR) return RenameOrSendAnew();
+    if (!IsNothingWritten(code)) GiveUp(code);
+    SetLeft(kLeftTemporary, false);
+    SendToThePlace();
+  }
+
+  // What is at the place is spared where nothing of this upload arrived: it may be the file that was there before.
+  void RemoveParts() {
+    if (fState.fLeft & kLeftTemporary) Remove(fOthers.fTemporary, kLeftTemporary);
+    if ((fState.fLeft & kLeftAtPlace) && fState.fMoved > 0) Remove(fNames.Name(), kLeftAtPlace);
   }
 
 private:
@@ -198,8 +209,18 @@ private:
            code == CURLE_REMOTE_FILE_NOT_FOUND || code == CURLE_SSH;
   }
 
-  CURLcode Send(std::string const& url, TCommands const& commandsAfter) {
-    TSource source{TDescriptor(::open(fFile.c_str(), O_RDONLY | O_CLOEXEC)), fState};
+  bool IsNothingWritten(CURLcode code) const { return fState.fMoved == 0 && fState.fReadError == 0 && IsRefusal(code); }
+
+  void SetLeft(ELeft what, bool isLeft) {
+    if (isLeft)
+      fState.fLeft |= what;
+    else
+      fState.fLeft &= ~static_cast<unsigned>(what);
+  }
+
+  // Once the server may have begun to write, `mark` is left there.
+  CURLcode Send(std::string const& url, TCommands const& commandsAfter, ELeft mark) {
+    TSource source{TDescriptor(::open(fFile.c_str(), O_RDONLY | O_CLOEXEC)), fState, mark};
     if (!source.fFile) {
       fState.fReadError = errno;
       return CURLE_READ_ERROR;
@@ -209,49 +230,60 @@ private:
     fConnection.Set(CURLOPT_TIMEOUT, 0L);
     fConnection.Set(CURLOPT_READFUNCTION, &ReadSource);
     fConnection.Set(CURLOPT_READDATA, &source);
+    fConnection.Set(CURLOPT_PREREQFUNCTION, &MarkBegun);
+    fConnection.Set(CURLOPT_PREREQDATA, &source);
     fConnection.SetCommandsAfter(commandsAfter);
     return fConnection.Perform(url);
   }
 
-  bool Command(TCommands const& commands) {
+  CURLcode Command(TCommands const& commands) {
     fConnection.Set(CURLOPT_UPLOAD, 0L);
     fConnection.Set(CURLOPT_NOBODY, 1L);
     fConnection.Set(CURLOPT_TIMEOUT, static_cast<long>(fCleanUpSeconds));
+    fConnection.Set(CURLOPT_PREREQFUNCTION, static_cast<curl_prereq_callback>(nullptr));
     fConnection.SetCommandsAfter(commands);
-    return fConnection.Perform(fNames.DirectoryUrl()) == CURLE_OK;
+    return fConnection.Perform(fNames.DirectoryUrl());
+  }
+
+  void Remove(std::string const& name, ELeft what) {
+    if (Command(fNames.Removal(name)) == CURLE_OK) SetLeft(what, false);
   }
 
   // The file has arrived, but did not get its name. Some servers do not rename onto another file: that is moved out of the way.
-  void RenameOrSendAnew(std::string const& temporary) {
-    std::string const& name = fNames.Name();
-    std::string const old = TemporaryNameFor(name);
-    if (Command(fNames.Renaming(name, old))) {
-      if (Command(fNames.Renaming(temporary, name))) {
-        Command(fNames.Removal(old));
-        return;
+  void RenameOrSendAnew() {
+    std::string const &name = fNames.Name(), &temporary = fOthers.fTemporary, &former = fOthers.fFormer;
+    SetLeft(kLeftFormer, true);
+    CURLcode const moved = Command(fNames.Renaming(name, former));
+    if (moved == CURLE_QUOTE_ERROR) SetLeft(kLeftFormer, false);  // refused
+    if (moved == CURLE_OK) {
+      if (Command(fNames.Renaming(temporary, name)) == CURLE_OK) {
+        SetLeft(kLeftTemporary, false);
+        return Remove(former, kLeftFormer);
       }
-      Command(fNames.Renaming(old, name));
+      if (Command(fNames.Renaming(former, name)) == CURLE_OK) SetLeft(kLeftFormer, false);
     }
-    Command(fNames.Removal(temporary));
+    Remove(temporary, kLeftTemporary);
     fState.fMoved = 0;
     SendToThePlace();
   }
 
   void SendToThePlace() {
-    CURLcode const code = Send(fNames.Url(), {});
-    if (code != CURLE_OK) GiveUp(code, fState.fMoved > 0 ? fNames.Name() : "");
+    CURLcode const code = Send(fNames.Url(), {}, kLeftAtPlace);
+    if (code == CURLE_OK || IsNothingWritten(code)) SetLeft(kLeftAtPlace, false);
+    if (code != CURLE_OK) GiveUp(code);
+    if (fState.fLeft & kLeftFormer) Remove(fOthers.fFormer, kLeftFormer);
   }
 
-  // Removes what may have arrived under that name, if any, and fails.
-  [[noreturn]] void GiveUp(CURLcode code, std::string const& name) {
+  // Removes what may have arrived, and fails.
+  [[noreturn]] void GiveUp(CURLcode code) {
     std::string const reason = fConnection.ErrorText();
-    bool const wasReached = code != CURLE_COULDNT_RESOLVE_HOST && code != CURLE_COULDNT_CONNECT && code != CURLE_LOGIN_DENIED;
-    if (wasReached) fState.fIsRemoved = name.empty() || Command(fNames.Removal(name));
+    RemoveParts();
     TConnection::FailFor(code, reason);
   }
 
   TConnection fConnection;
   TNames const fNames;
+  TUploadNames const fOthers;
   std::string const fFile;
   int const fCleanUpSeconds;
   TTransferState& fState;
@@ -266,6 +298,7 @@ public:
     fConnection.Set(CURLOPT_WRITEFUNCTION, &Write);
     fConnection.Set(CURLOPT_WRITEDATA, this);
     fConnection.Set(CURLOPT_FILETIME, 1L);
+    fConnection.Set(CURLOPT_MAXFILESIZE_LARGE, static_cast<curl_off_t>(mostBytes));  // where the server tells the size
   }
 
   void Run(std::string const& url) {
@@ -282,6 +315,9 @@ public:
       fIsOther = false;
       code = Fetch(url);
     }
+    bool const isWholeTooLarge = code == CURLE_OK && fMostBytes > 0 && fStart > fMostBytes;
+    if (code == CURLE_FILESIZE_EXCEEDED || isWholeTooLarge) fState.fIsTooLarge = true;
+    if (fState.fIsTooLarge) FailFor(code);
     if (code == CURLE_OK && !fFile) Open();  // of an empty remote file no byte comes
     if (code != CURLE_OK || fError != 0) FailFor(code);
   }
@@ -348,9 +384,25 @@ private:
 
 }  // namespace
 
-TZEPStatusCode Upload(TRemote const& place, std::string const& file, int cleanUpSeconds, TTransferState& state) {
-  TUpload(place, file, cleanUpSeconds, state).Run();
+TUploadNames NamesForUpload(TRemote const& place) {
+  std::string const name = Decoded(NameIn(place.fPath));
+  return {TemporaryNameFor(name), TemporaryNameFor(name)};
+}
+
+TRemote Beside(TRemote const& place, std::string const& name) {
+  TRemote other = place;
+  other.fPath = DirectoryOf(place.fPath) + EncodedName(name);
+  return other;
+}
+
+TZEPStatusCode Upload(TRemote const& place, TUploadNames const& names, std::string const& file, int cleanUpSeconds,
+                      TTransferState& state) {
+  TUpload(place, names, file, cleanUpSeconds, state).Run();
   return kZEPStatusOK;
+}
+
+void RemoveParts(TRemote const& place, TUploadNames const& names, int cleanUpSeconds, TTransferState& state) {
+  TUpload(place, names, "", cleanUpSeconds, state).RemoveParts();
 }
 
 TZEPStatusCode Download(TRemote const& remote, std::string const& file, bool isThere, std::uint64_t mostBytes,

@@ -46,7 +46,7 @@ bool IsOverwritingWanted(std::string const& file) {
 std::string WhyNotWritten(TArguments const& arguments, std::string const& file, fs::file_status const& status) {
   if (!fs::exists(status)) return "";
   if (fs::is_directory(status)) return Printable(file) + " is a directory";
-  if (!fs::is_regular_file(status)) return Printable(file) + " is no regular file";
+  if (!fs::is_regular_file(status)) return Printable(file) + " is not a regular file";
   if (arguments.fForce) return "";
   if (!arguments.fNoClobber && ::isatty(STDIN_FILENO))
     return IsOverwritingWanted(file) ? "" : Printable(file) + " is left as it is";
@@ -91,11 +91,11 @@ TRun AddGetArguments(CLI::App& command) {
                 "The most bytes that are fetched (10 GiB), such as 500K, 2M or 1G; 0: no limit");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
-      "A file that is there is overwritten after a question, which is asked on a terminal only; of a symbolic link the file "
-      "that\n"
-      "it leads to. Until all has arrived the file bears \".part\" behind its name; what arrived of a broken transfer keeps "
-      "that\n"
-      "name, and the next one goes on with it where the server allows that and the file there is still the same.\n" +
+      "A file that is there is overwritten after a question, which is asked on a terminal only; of a symbolic link the file\n"
+      "that it leads to. Until all has arrived the file has \".part\" after its name. A broken transfer leaves that file, and "
+      "the\n"
+      "next one goes on with it where the server can start in the middle and tells (FTP: by MDTM) that the file has the same\n"
+      "time as before; otherwise all of it is fetched again.\n" +
       TransferHelp());
   return [arguments] { return Get(*arguments); };
 }

@@ -44,10 +44,10 @@ TRun AddSendArguments(CLI::App& command) {
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
-      "Missing directories are made on the server; a file that is there is overwritten, where the server can rename in one go\n"
-      "when all has arrived: until then the file bears \".part\" and a number behind its name. A host gets the file in the "
-      "directory\n"
-      "of the user, or, when ZEP_ISBOOTABLE is \"yes\", in hostline/toqrv/vantor/fdr_upload.\n" +
+      "Missing directories are made on the server. The file is sent under its name with a number and \".part\" after it, and is\n"
+      "renamed when all has arrived; a file of that name is then replaced. Where the server refuses that, the file is sent to\n"
+      "its place itself. A host gets the file in the directory of the user, or, when ZEP_ISBOOTABLE is \"yes\", in\n"
+      "hostline/toqrv/vantor/fdr_upload.\n" +
       TransferHelp() + " 2 when the file changed while it was sent.");
   return [arguments] { return Send(*arguments); };
 }

@@ -49,6 +49,7 @@ TSentReport WriteAndSend(TReport const& report, TTarget const& target, TTransfer
 
 void Tell(TSentReport const& sent, bool isQuiet) {
   TTransferred const& transferred = sent.fTransferred;
+  WarnOfLeft(transferred);
   if (transferred.fOutcome.fExit == kExitComplete) {
     if (isQuiet) return;
     std::cerr << "zep: sent to " << transferred.fUrl << ": " << transferred.fBytes << " bytes, SHA-256 " << transferred.fSha256

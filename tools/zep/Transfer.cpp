@@ -5,12 +5,15 @@
 #include "FileTransfer.h"
 #include "Output.h"
 #include "Sha256.h"
+#include "TChildProcess.h"
 #include "Terminal.h"
 #include "Text.h"
 #include "Unreachable.h"
 
 #include <fcntl.h>
 #include <linux/fs.h>
+#include <poll.h>
+#include <signal.h>
 #include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -28,6 +31,7 @@
 #include <iostream>
 #include <limits>
 #include <string_view>
+#include <vector>
 
 namespace NQRVZEP20::zep {
 
@@ -124,7 +128,7 @@ bool IsSameFile(struct stat const& a, struct stat const& b) { return a.st_dev ==
 // Why a file cannot be sent; empty when it can.
 std::string WhyNotReadable(std::string const& file, struct stat& status) {
   if (::stat(file.c_str(), &status) != 0) return ReasonOf(errno);
-  if (!S_ISREG(status.st_mode)) return "it is no regular file";
+  if (!S_ISREG(status.st_mode)) return "it is not a regular file";
   TDescriptor const opened(::open(file.c_str(), O_RDONLY | O_CLOEXEC));
   char first;
   return opened && ::pread(opened.Get(), &first, 1, 0) >= 0 ? "" : ReasonOf(errno);
@@ -155,11 +159,38 @@ int CleanUpSecondsOf(TTransferOptions const& options) {
   return options.fStallSeconds > 0 ? std::clamp(options.fStallSeconds / 2, 1, kMost) : kMost;
 }
 
-// What is known besides of an upload that failed.
-void ExplainUpload(TOutcome& outcome, TTransferState const& state) {
-  bool const mayBeThere = outcome.fExit == kExitNothing || outcome.fExit == kExitStalled || outcome.fExit >= kExitHangUp;
+// Removes what an upload left whose process was ended, where the server can be reached soon. One more interrupt ends the wait.
+void CleanUp(TRemote const& place, TUploadNames const& names, int seconds, TTransferState& state) {
+  constexpr int kMost = 5;
+  int const limit = std::min(seconds, kMost);
+  TChildProcess const child(
+      [&] {
+        RemoveParts(place, names, limit, state);
+        return std::string("done");
+      },
+      SIGKILL);
+  pollfd waiting{child.Output(), POLLIN, 0};
+  ::poll(&waiting, 1, limit * 1000);
+}
+
+std::string JoinedByAnd(std::vector<std::string> const& texts) {
+  std::string joined;
+  for (std::string const& text : texts) joined += (joined.empty() ? "" : " and ") + text;
+  return joined;
+}
+
+// What is known besides of an upload: why its file could not be read, and what may be left on the server.
+void ExplainUpload(TTransferred& transferred, TRemote const& place, TUploadNames const& names, TTransferState const& state) {
+  TOutcome& outcome = transferred.fOutcome;
   if (state.fReadError != 0) outcome = {outcome.fStatus, kExitNoInput, ReasonOf(state.fReadError)};
-  if (mayBeThere && !state.fIsRemoved) outcome.fReason += "; the server may have a part of it";
+  std::vector<std::string>& left = transferred.fLeftOnServer;
+  if (state.fLeft & kLeftTemporary) left.push_back(ShownUrlOf(Beside(place, names.fTemporary)));
+  if (state.fLeft & kLeftAtPlace) left.push_back(ShownUrlOf(place));
+  if (outcome.fExit != kExitComplete && !left.empty())
+    outcome.fReason += "; the server may have a part of it: " + JoinedByAnd(left);
+  if ((state.fLeft & kLeftFormer) == 0) return;
+  left.push_back(ShownUrlOf(Beside(place, names.fFormer)));
+  if (outcome.fExit != kExitComplete) outcome.fReason += "; the file that was there may now be " + left.back();
 }
 
 // ---- Fetching ----
@@ -254,14 +285,17 @@ bool CanMakePart(std::string const& part, bool isThere) {
   return true;
 }
 
-TTransferred BrokenOff(TTransferred transferred, TTransferState const& state, TTransferOptions const& options) {
+TTransferred BrokenOff(TTransferred transferred, bool wasThere, TTransferState const& state, TTransferOptions const& options) {
   std::string const& part = transferred.fFile;
   if (transferred.fOutcome.fStatus == kZEPStatusAlreadyExists)
     return Failed(transferred, kExitNotWritten, "another program has made this file meanwhile");
-  if (state.fIsTooLarge)
+  if (state.fIsTooLarge) {
     transferred.fOutcome.fReason = "the file is larger than " + ExactSizeText(options.fMostBytes) + "; --max-size allows more";
-  else
+    bool const isKept = wasThere || (::unlink(part.c_str()) != 0 && errno != ENOENT);
+    if (!isKept) return transferred;
+  } else {
     BlameTheDisk(transferred.fOutcome, part);
+  }
   MarkForResuming(part, state);
   transferred.fOutcome.fReason += PartText(part);
   return transferred;
@@ -332,13 +366,15 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
   transferred.fUrl = ShownUrlOf(place);
   TSharedTransferState const state;
   int const cleanUpSeconds = CleanUpSecondsOf(options);
+  TUploadNames const names = NamesForUpload(place);
   transferred.fOutcome =
-      Transfer([&] { return Upload(place, file, cleanUpSeconds, *state); }, *state, transferred.fBytes, options);
+      Transfer([&] { return Upload(place, names, file, cleanUpSeconds, *state); }, *state, transferred.fBytes, options);
+  EExitStatus const exit = transferred.fOutcome.fExit;
+  bool const wasEnded = exit == kExitStalled || exit >= kExitHangUp;
+  if (wasEnded && (state->fLeft & (kLeftTemporary | kLeftAtPlace))) CleanUp(place, names, cleanUpSeconds, *state);
   ExplainNoConnection(transferred.fOutcome, place);
-  if (transferred.fOutcome.fExit != kExitComplete) {
-    ExplainUpload(transferred.fOutcome, *state);
-    return transferred;
-  }
+  ExplainUpload(transferred, place, names, *state);
+  if (exit != kExitComplete) return transferred;
   bool const isAsBefore = IsAsBefore(file, before);
   if (isAsBefore) transferred.fSha256 = Sha256Of(file);
   if (!isAsBefore || !IsAsBefore(file, before)) return Failed(transferred, kExitPartial, "the file changed while it was sent");
@@ -358,8 +394,15 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
   std::uint64_t const most = options.fMostBytes;
   transferred.fOutcome = Transfer([&] { return Download(remote, part, isThere, most, *state); }, *state, 0, options);
   ExplainNoConnection(transferred.fOutcome, remote);
-  if (transferred.fOutcome.fExit != kExitComplete) return BrokenOff(transferred, *state, options);
+  if (transferred.fOutcome.fExit != kExitComplete) return BrokenOff(transferred, isThere, *state, options);
   return Completed(transferred, file, overwrites);
+}
+
+void WarnOfLeft(TTransferred const& transferred) {
+  bool const isComplete = transferred.fOutcome.fExit == kExitComplete;  // else the reason tells
+  if (!isComplete || transferred.fLeftOnServer.empty()) return;
+  std::cerr << "zep: warning: the server did not remove " << JoinedByAnd(transferred.fLeftOnServer)
+            << ", which the upload needed for a while\n";
 }
 
 TJson DocumentOf(TTransferred const& transferred, std::string const& command) {
@@ -369,6 +412,7 @@ TJson DocumentOf(TTransferred const& transferred, std::string const& command) {
   document["file"] = transferred.fFile;
   document["bytes"] = isComplete ? TJson(transferred.fBytes) : TJson(nullptr);
   document["sha256"] = isComplete ? TJson(transferred.fSha256) : TJson(nullptr);
+  if (command == "zep send") document["leftOnServer"] = transferred.fLeftOnServer;
   return document;
 }
 
@@ -381,6 +425,7 @@ int TellOf(TTransferred const& transferred, std::string const& command, bool asJ
     WriteOutput(transferred.fUrl + ", " + Printable(transferred.fFile) + ": " + std::to_string(transferred.fBytes) +
                 " bytes, SHA-256 " + transferred.fSha256 + "\n");
   }
+  WarnOfLeft(transferred);
   if (!isComplete)
     std::cerr << "zep: " << transferred.fUrl << ", " << Printable(transferred.fFile) << ": " << outcome.fReason << "\n";
   return outcome.fExit;

@@ -7,6 +7,7 @@
 
 #include <cstdint>
 #include <string>
+#include <vector>
 
 namespace CLI {
 class App;
@@ -38,8 +39,12 @@ struct TTransferred {
   std::string fUrl;  // for people
   std::string fFile;
   std::uint64_t fBytes = 0;
-  std::string fSha256;  // of the local file; when all went well
+  std::string fSha256;                     // of the local file; when all went well
+  std::vector<std::string> fLeftOnServer;  // URLs for people: what an upload may have left there beside the file
 };
+
+// Warns on standard error of what an upload that went well left on the server.
+void WarnOfLeft(TTransferred const& transferred);
 
 // Where a file is to be sent: a URL (which ends in "/" when the name is still to be added), or a host alone.
 struct TTarget {
