@@ -45,7 +45,7 @@ void TPrivateFile::WarnWhenOthersMayRead() const {
   static std::set<std::string> warned;
   if (!S_ISREG(fMode) || (fMode & S_IROTH) == 0 || !warned.insert(fPath).second) return;
   std::cerr << "zep: warning: every user may read the passwords in " << Printable(fPath) << " (mode " << Octal(fMode)
-            << "); chmod 600 ends that\n";
+            << "); chmod 600 makes it private\n";
 }
 
 std::string NameOfPrivateFile(std::string const& path, std::string const& option) {

@@ -9,6 +9,7 @@
 #include "TScratchDirectory.h"
 #include "Text.h"
 #include "Transfer.h"
+#include "Unreachable.h"
 
 #include <CLI/CLI.hpp>
 
@@ -41,7 +42,7 @@ std::string AnswerIn(std::string const& page) {
   std::string const start = "<title>";
   std::size_t const title = page.find(start), end = page.find("</title>");
   if (title == page.npos || end == page.npos || end < title) return "what came back begins with: " + FirstLineOf(page);
-  return "what came back is entitled: " + FirstLineOf(page.substr(title + start.size(), end - title - start.size()));
+  return "the title of the page that arrived is: " + FirstLineOf(page.substr(title + start.size(), end - title - start.size()));
 }
 
 // A file of any size, of which no more than a piece is in memory at a time.
@@ -69,6 +70,13 @@ bool IsCutAt(std::string const& file, std::uint64_t mostBytes) {
   return mostBytes > 0 && std::filesystem::file_size(file, absent) >= mostBytes && !absent;
 }
 
+// The library gives libcurl's words, which name no remedy.
+void ExplainNoConnection(TOutcome& outcome, TRemote const& proxy) {
+  constexpr int kProbeSeconds = 3;
+  std::string const why = WhyUnreachable(proxy.fHost, proxy.fPort, kProbeSeconds);
+  if (!why.empty()) outcome.fReason = Printable(why);
+}
+
 // Something may come back from the proxy itself: its refusal, or that it cannot reach the page. So the page has to be the one.
 TOutcome Check(TRemote const& proxy, TArguments const& arguments) {
   TScratchDirectory const scratch("zep-proxy-check");  // the library writes the page into the working directory
@@ -81,6 +89,7 @@ TOutcome Check(TRemote const& proxy, TArguments const& arguments) {
       },
       watch);
   bool const isCut = outcome.fExit == kExitNothing && IsCutAt(pageFile, arguments.fMostBytes);
+  if (outcome.fExit == kExitNoConnection) ExplainNoConnection(outcome, proxy);
   if (outcome.fExit != kExitComplete && !isCut) return outcome;
   if (HoldsText(pageFile, ZEP_PROXY_CHECK_TEXT)) return {};
   std::string const size = isCut ? ", and is larger than " + ExactSizeText(arguments.fMostBytes) + " (--max-page)" : "";

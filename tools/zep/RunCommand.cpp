@@ -9,11 +9,15 @@
 #include "TOSSpecific.h"
 #include "Text.h"
 
+#include <unistd.h>
+
 #include <CLI/CLI.hpp>
 
+#include <cstdlib>
 #include <iostream>
 #include <limits>
 #include <memory>
+#include <sstream>
 
 namespace NQRVZEP20::zep {
 
@@ -26,8 +30,22 @@ struct TArguments {
   bool fAsJson = false;
 };
 
+// As execvp looks for it; where PATH is missing it has its own.
+bool IsFound(std::string const& program) {
+  if (program.find('/') != program.npos) return ::access(program.c_str(), F_OK) == 0;
+  char const* const path = std::getenv("PATH");
+  if (path == nullptr) return true;
+  std::istringstream directories(std::string(path) + ":");
+  for (std::string directory; std::getline(directories, directory, ':');)
+    if (::access(((directory.empty() ? "." : directory) + "/" + program).c_str(), F_OK) == 0) return true;
+  return false;
+}
+
 // The library tells only that a command failed, not how.
 std::string WhyItFailed(std::string const& program, int timeout) {
+  if (!IsFound(program))
+    return program.find('/') != program.npos ? program + " does not exist"
+                                             : program + " was not found on PATH; is it spelled right, and installed?";
   std::string reason = program + " could not be executed, did not exit with 0 or was ended by a signal";
   if (timeout != kForEver) reason += ", or was silent for more than " + std::to_string(timeout) + " s and is left running";
   return reason;

@@ -479,7 +479,7 @@ TEST_F(ZepTransferTest, ANetrcThatEveryUserMayReadIsWarnedOf) {
   std::string const command = "send --quiet --netrc " + netrc + " " + file + " ftp://127.0.0.1:" + server_->Port() + "/f";
   fs::permissions(netrc, static_cast<fs::perms>(0644));
   EXPECT_EQ(Zep(command).output,
-            "zep: warning: every user may read the passwords in " + netrc + " (mode 0644); chmod 600 ends that\n");
+            "zep: warning: every user may read the passwords in " + netrc + " (mode 0644); chmod 600 makes it private\n");
   fs::permissions(netrc, static_cast<fs::perms>(0600));
   EXPECT_EQ(Zep(command).output, "");
 }
@@ -903,10 +903,13 @@ TEST(ZepProxyCheckTest, PassesOnlyWhenThePageComesBack) {
 
   run = Zep("proxy-check zep:topsecret@" + shown);
   EXPECT_EQ(run.exitCode, kNothing);
-  EXPECT_THAT(run.output,
-              AllOf(HasSubstr("the page did not come through; what came back is entitled: 40"), Not(HasSubstr("topsecret"))));
+  EXPECT_THAT(run.output, AllOf(HasSubstr("the page did not come through; the title of the page that arrived is: 40"),
+                                Not(HasSubstr("topsecret"))));
   proxy.reset();
-  EXPECT_EQ(Zep("proxy-check zep:secret@" + shown).exitCode, kNoConnection);
+  run = Zep("proxy-check zep:secret@" + shown);
+  EXPECT_EQ(run.exitCode, kNoConnection);
+  EXPECT_EQ(run.output, "zep: proxy " + shown + ": 127.0.0.1 refuses connections to port " + port +
+                            "; is the server running, and the port right?\n");
 
   proxy = std::make_unique<TServer>("proxy.sh", std::vector<std::string>{"0", "0"},
                                     std::map<std::string, std::string>{{"WEB_PAGE", dir.Path("other")}, {"PROXY_AUTH", "none"}});
@@ -925,7 +928,7 @@ TEST(ZepProxyCheckTest, PassesOnlyWhenThePageComesBack) {
   // A page that repeats what the proxy was told.
   WriteFile(dir.Path("other"), "<title>no topsecret, dXNlcjp0b3BzZWNyZXQ= or http://user:topsecret@h</title>");
   run = Zep("proxy-check user:topsecret@127.0.0.1:" + proxy->Port());
-  EXPECT_THAT(run.output, EndsWith("is entitled: no ***, *** or http://user:***@h\n"));
+  EXPECT_THAT(run.output, EndsWith("the title of the page that arrived is: no ***, *** or http://user:***@h\n"));
 
   for (char const* wrong : {"127.0.0.1", "ftp://127.0.0.1:1", "127.0.0.1:1/path", "127.0.0.1:http"})
     EXPECT_EQ(Zep(std::string("proxy-check ") + wrong).exitCode, kUsage) << wrong;

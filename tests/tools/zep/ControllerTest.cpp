@@ -220,7 +220,7 @@ TEST_F(ZepRemoteTest, APasswordFileThatEveryUserMayReadIsWarnedOf) {
   fs::permissions(file, static_cast<fs::perms>(0644));
   TRun const run = Run({"host", "--user", "u", "--password-file", file});
   EXPECT_EQ(run.errors, "zep: warning: every user may read the passwords in " + file +
-                            " (mode 0644); chmod 600 ends that\nzep: host: " + kNothing + "\n");
+                            " (mode 0644); chmod 600 makes it private\nzep: host: " + kNothing + "\n");
   fs::permissions(file, static_cast<fs::perms>(0640));
   EXPECT_EQ(Run({"host", "--user", "u", "--password-file", file}).errors, "zep: host: " + kNothing + "\n");
 }
