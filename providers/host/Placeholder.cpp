@@ -80,12 +80,16 @@ std::string Lower(std::string_view text) {
   return lower;
 }
 
+// Control characters too, such as those of a line's end.
+bool IsBlank(char c) { return (c >= 0 && c <= ' ') || c == '\x7f'; }
+
 std::string_view WithoutOuterBlanks(std::string_view text) {
-  constexpr std::string_view blanks = " \t";
-  std::size_t const first = text.find_first_not_of(blanks);
-  if (first == std::string_view::npos) return {};
-  return text.substr(first, text.find_last_not_of(blanks) - first + 1);
+  while (!text.empty() && IsBlank(text.front())) text.remove_prefix(1);
+  while (!text.empty() && IsBlank(text.back())) text.remove_suffix(1);
+  return text;
 }
+
+bool HasOnly(std::string_view text, char c) { return !text.empty() && text.find_first_not_of(c) == std::string_view::npos; }
 
 template <std::size_t N>
 bool IsOneOf(std::string_view const (&list)[N], std::string_view text) {
@@ -106,7 +110,7 @@ bool IsRowOfFillers(std::string_view text) {
 
 bool IsPlaceholder(std::string_view text) {
   std::string const lower = Lower(WithoutOuterBlanks(text));
-  return IsOneOf(kPlaceholders, lower) || IsNumberedPlaceholder(lower) || IsRowOfFillers(lower);
+  return IsOneOf(kPlaceholders, lower) || IsNumberedPlaceholder(lower) || IsRowOfFillers(lower) || HasOnly(lower, '-');
 }
 
 TFinding<std::string> HostNameOf(std::string const& nodeName) {
@@ -119,6 +123,8 @@ TFinding<std::string> HostNameOf(std::string const& nodeName) {
 TFinding<std::string> WithoutPlaceholder(TFinding<std::string> const& text) {
   if (!text) return text;
   if (WithoutOuterBlanks(*text).empty()) return TMissing{kMissingNotGiven, "the firmware gives a blank text"};
+  if (HasOnly(WithoutOuterBlanks(*text), '\xff'))  // memory that was never written
+    return TMissing{kMissingNotGiven, "not programmed in the firmware's table (0xFF)"};
   if (IsPlaceholder(*text)) return TMissing{kMissingPlaceholder, "placeholder text of the firmware: \"" + *text + "\""};
   return text;
 }

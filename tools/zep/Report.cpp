@@ -13,6 +13,7 @@
 #include <cctype>
 #include <cstdio>
 #include <cstdlib>
+#include <iterator>
 #include <map>
 
 namespace NQRVZEP20::zep {
@@ -27,7 +28,8 @@ using TViews = std::vector<TNamespaceView>;
 std::string const& kSystem = TCIMSchemaHelper::kSystemCreationClassName;
 std::string const& kOperatingSystem = TCIMSchemaHelper::kOperatingSystemCreationClassName;
 std::string const kProduct = "QRVSG_ZEPProduct";
-constexpr char const* kUnknownModel = "xxx";  // what the helper answers when the product name has no model
+constexpr char const* kMissingPlaceholder = "placeholder";  // a text that stands for none
+constexpr char const* kUnknownModel = "xxx";                // what the helper answers when the product name has no model
 
 struct TQuestion;
 TAnswer AnswerTo(TQuestion const& question, TNamespaceView const& view);
@@ -44,11 +46,14 @@ struct TQuestion {
   TAnswer (*fWhenRefused)(TAnswer const& raw) = NotOfTheForm;  // of a value that the helper does not take
 };
 
+// Blanks and control characters, such as those of a line's end.
 std::string WithoutOuterBlanks(std::string const& text) {
-  constexpr char const* blanks = " \t";
-  std::size_t const first = text.find_first_not_of(blanks);
-  return first == std::string::npos ? "" : text.substr(first, text.find_last_not_of(blanks) - first + 1);
+  auto const isBlank = [](char c) { return (c >= 0 && c <= ' ') || c == '\x7f'; };
+  auto const first = std::find_if_not(text.begin(), text.end(), isBlank);
+  return {first, std::find_if_not(text.rbegin(), std::make_reverse_iterator(first), isBlank).base()};
 }
+
+bool HasOnly(std::string const& text, char c) { return !text.empty() && text.find_first_not_of(c) == std::string::npos; }
 
 TAnswer NotOfTheForm(TAnswer const& raw) {
   return TAnswer::Unknown({kMissingUnexpected, "not in the expected form: \"" + raw.fValue + "\""}, raw.fSource);
@@ -75,11 +80,13 @@ TAnswer AnswerTo(TQuestion const& question, TNamespaceView const& view) {
   }
 }
 
-// "Server Q100 -[1234AB7]-"
-bool HasBrackets(std::string const& productName) {
+// Where the brackets begin in "Server Q100 -[1234AB7]-"; npos when there are none.
+std::size_t StartOfBrackets(std::string const& productName) {
   std::size_t const opening = productName.find("-[");
-  return opening != std::string::npos && productName.find(']', opening) != std::string::npos;
+  return productName.find(']', opening) == std::string::npos ? std::string::npos : opening;
 }
+
+bool HasBrackets(std::string const& productName) { return StartOfBrackets(productName) != std::string::npos; }
 
 // A machine whose product name has no brackets has neither type nor model.
 TAnswer NoTypeAndModel(TAnswer const& productName) {
@@ -106,6 +113,9 @@ TAnswer AnswerWithSerialNumber(TQuestion const& question, TNamespaceView const& 
   TAnswer answer = AnswerTo(question, view);
   if (!answer.fIsKnown) return answer;
   answer.fValue = WithoutOuterBlanks(answer.fValue);
+  if (HasOnly(answer.fValue, '\xff')) return TAnswer::Unknown({kMissingNotGiven, "not programmed (0xFF)"}, answer.fSource);
+  if (HasOnly(answer.fValue, '-'))
+    return TAnswer::Unknown({kMissingPlaceholder, "placeholder text of the provider: \"" + answer.fValue + "\""}, answer.fSource);
   if (!IsOfOwnForm(answer.fValue)) answer.fNote = "not in the collector's own form: 7 letters and digits";
   return answer;
 }
@@ -240,7 +250,7 @@ std::string ValueOr(TAnswer const& answer, std::string const& otherwise) { retur
 
 // Without the brackets with type and model, which the line tells by themselves.
 std::string WithoutTypeAndModel(std::string const& productName) {
-  std::string const name = productName.substr(0, productName.find("-["));
+  std::string const name = productName.substr(0, StartOfBrackets(productName));
   std::size_t const last = name.find_last_not_of(' ');
   return last == std::string::npos ? productName : name.substr(0, last + 1);
 }

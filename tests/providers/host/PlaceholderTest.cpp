@@ -32,6 +32,9 @@ TEST(PlaceholderTest, TextsThatStandForNoneAreKnown) {
                            "xXxX",
                            "....",
                            "-------",
+                           "-",
+                           "--\r\n",
+                           "\x01None\x7f",
                            "FFFFFFFF",
                            "  None ",
                            "Default string\t",
@@ -74,12 +77,22 @@ TEST(PlaceholderTest, AFindingLosesItsPlaceholderAndTellsIt) {
   EXPECT_EQ(placeholder.Why().fCode, "placeholder");
   EXPECT_EQ(placeholder.Why().fReason, "placeholder text of the firmware: \"Default string\"");
 
-  for (char const* blank : {"", " ", " \t "}) {
+  for (char const* blank : {"", " ", " \t ", "\r\n\x01"}) {
     auto const missing = WithoutPlaceholder(std::string(blank));
     ASSERT_FALSE(missing);
     EXPECT_EQ(missing.Why().fCode, "not-given");
     EXPECT_EQ(missing.Why().fReason, "the firmware gives a blank text");
   }
+}
+
+TEST(PlaceholderTest, MemoryThatWasNeverWrittenIsNotProgrammed) {
+  for (char const* text : {"\xff", " \xff\xff\xff\n"}) {
+    auto const missing = WithoutPlaceholder(std::string(text));
+    ASSERT_FALSE(missing);
+    EXPECT_EQ(missing.Why().fCode, "not-given");
+    EXPECT_EQ(missing.Why().fReason, "not programmed in the firmware's table (0xFF)");
+  }
+  EXPECT_TRUE(WithoutPlaceholder(std::string("A\xff")));
 }
 
 TEST(PlaceholderTest, TheKernelsNameForNoNameIsNoHostName) {

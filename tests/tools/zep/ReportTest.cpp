@@ -174,6 +174,7 @@ TEST_F(ReportTest, TheSerialNumberOfEveryMakersFormIsShownAndTheIdentityComplete
       {"Rackhost R5200 Gen3", "9000116105", "9000116105", false},
       {"Node 7 (2U)", "7F6K2L9Q", "7F6K2L9Q", false},
       {"Workcenter T-20", "SN/2231-07.A     ", "SN/2231-07.A", false},
+      {"Storbox 12G", "\x01S400001X9912345\r\n", "S400001X9912345", false},
       {"Storbox 12G", "S400001X9912345 \t ", "S400001X9912345", false},
       {"Virtual Machine 7.1", longest, longest, false},
       {"Blade [half height]", "..QX731..ZZ09912.", "..QX731..ZZ09912.", false},
@@ -227,7 +228,7 @@ TEST_F(ReportTest, OnlyAProductNameWithoutBracketsExplainsThatThereIsNoTypeAndMo
       {"Server Q100 -[1234AB78]-", "Server Q100, type unknown, model unknown", "unexpected-form", "unexpected-form", 2},
       {"1234", "1234, type 1234, no model", nullptr, "not-applicable", 0},
       {"1234AB7", "1234AB7, type 1234, model AB7", nullptr, nullptr, 0},
-      {"Rack -[ 2U", "Rack, no machine type and model", "not-applicable", "not-applicable", 0},
+      {"Rack -[ 2U", "Rack -[ 2U, no machine type and model", "not-applicable", "not-applicable", 0},
       {"]- Rack", "]- Rack, no machine type and model", "not-applicable", "not-applicable", 0},
       {"None", "unknown product, type unknown, model unknown", "placeholder", "placeholder", 2},
   };
@@ -252,6 +253,20 @@ TEST_F(ReportTest, PlaceholdersOfTheFirmwareAreToldAsSuch) {
   EXPECT_EQ(ValueIn(run.output, "Product name"), "unknown: placeholder text of the firmware: \"To Be Filled By O.E.M.\"");
   EXPECT_EQ(ValueIn(run.output, "Machine type"), "unknown: placeholder text of the firmware: \"To Be Filled By O.E.M.\"");
   EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: placeholder text of the firmware: \"System Serial Number\"");
+}
+
+TEST_F(ReportTest, ASerialNumberThatWasNeverWrittenIsMissing) {
+  struct TRow {
+    char const *serialNumber, *code, *shown;
+  } const rows[] = {
+      {"\xff\xff\xff\xff\xff\xff\xff ", "not-given", "unknown: not programmed in the firmware's table (0xFF)"},
+      {" - ", "placeholder", "unknown: placeholder text of the firmware: \" - \""},
+  };
+  for (TRow const& row : rows) {
+    std::string const table = zep_.Table(SystemInformation("Rackhost R5200", row.serialNumber) + EndOfTable());
+    EXPECT_EQ(JsonOf(Report(table, {"--json"}))["identity"]["serialNumber"]["code"], row.code);
+    EXPECT_EQ(WithoutBlanks(ValueIn(Report(table).output, "Serial number")), WithoutBlanks(row.shown));
+  }
 }
 
 TEST_F(ReportTest, TwoKindsOfProcessorAndModulesOfUnknownSizeAreToldApart) {
