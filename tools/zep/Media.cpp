@@ -126,9 +126,10 @@ std::string WithoutTrailingSlashes(std::string name) {
 }
 
 void CheckDevice(std::string const& device) {
-  if (device.find('@') != device.npos) throw TWrongUsage("that is no name of a device");  // it may have a password in it
+  if (device.find('@') != device.npos) throw TWrongUsage("that is not a name of a device");  // it may have a password in it
   if (device.rfind("/dev/", 0) != 0 || !IsPlainPath(device))
-    throw TWrongUsage("\"" + device + "\" is no name of a device: below /dev, of letters, digits, \"/\", \"-\", \"_\" and \".\"");
+    throw TWrongUsage("\"" + device +
+                      "\" is not a name of a device: below /dev, of letters, digits, \"/\", \"-\", \"_\" and \".\"");
   if (!TOSSpecific::FileExists(device)) throw std::runtime_error("there is no device " + device);
 }
 

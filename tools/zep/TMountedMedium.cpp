@@ -61,7 +61,7 @@ void RefuseOther(std::optional<TMount> const& mount, std::string const& mountPoi
 void RefuseStranger(std::string const& device) {
   std::string const next = FirstPartitionOf(device);
   if (NumberOf(next) != 0 && !IsPartitionOf(next, device))
-    Throw(device + " is not mounted: " + next + ", which would be tried as well, is no partition of it");
+    Throw(device + " is not mounted: " + next + ", which would be tried as well, is not a partition of it");
 }
 
 // The library runs it by the shell, and takes its absence for a medium that cannot be read.
@@ -100,7 +100,7 @@ void CheckDirectory(std::string const& directory) {
   auto const isBelow = [&](char const* place) { return directory.rfind(place, 0) == 0; };
   if (IsPlainPath(directory) && (isBelow("/mnt/") || isBelow("/media/") || isBelow("/run/media/"))) return;
   throw TWrongUsage("\"" + directory +
-                    "\" is no mount point of a medium: below /mnt, /media or /run/media, of letters, digits, " +
+                    "\" is not a mount point of a medium: below /mnt, /media or /run/media, of letters, digits, " +
                     "\"/\", \"-\", \"_\" and \".\"");
 }
 

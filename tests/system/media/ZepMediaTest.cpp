@@ -226,8 +226,8 @@ TEST_F(ZepMediaTest, AnotherDevicesPartitionIsNeverTakenForTheFirstOne) {
         Do("umount /mnt/key");
         return text;
       }),
-      "zep: /dev/shm/key1 is not mounted: /dev/shm/key11, which would be tried as well, is no partition of it\nexit status 1\n"
-      "zep: /dev/shm/key1 is not mounted: /dev/shm/key11, which would be tried as well, is no partition of it\nexit status 1\n"
+      "zep: /dev/shm/key1 is not mounted: /dev/shm/key11, which would be tried as well, is not a partition of it\nexit status 1\n"
+      "zep: /dev/shm/key1 is not mounted: /dev/shm/key11, which would be tried as well, is not a partition of it\nexit status 1\n"
       "unmounted\n"
       "zep: /mnt/key holds /dev/shm/key11; unmount that first\nexit status 1\n"
       "zep: /mnt/key holds /dev/shm/key11; unmount that first\nexit status 1\n"

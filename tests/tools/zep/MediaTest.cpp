@@ -314,16 +314,16 @@ TEST_F(MediaCommandTest, RefusesNamesBeforeAnythingIsRun) {
     char const* errors;
   };
   TRow const rows[] = {
-      {{"mount", "/dev/sdb;reboot"}, 64, "zep: \"/dev/sdb;reboot\" is no name of a device"},
-      {{"mount", "/etc/passwd"}, 64, "zep: \"/etc/passwd\" is no name of a device"},
-      {{"mount", "/dev/../etc/passwd"}, 64, "zep: \"/dev/../etc/passwd\" is no name of a device"},
-      {{"mount", "/dev/$HOME"}, 64, "zep: \"/dev/$HOME\" is no name of a device"},
+      {{"mount", "/dev/sdb;reboot"}, 64, "zep: \"/dev/sdb;reboot\" is not a name of a device"},
+      {{"mount", "/etc/passwd"}, 64, "zep: \"/etc/passwd\" is not a name of a device"},
+      {{"mount", "/dev/../etc/passwd"}, 64, "zep: \"/dev/../etc/passwd\" is not a name of a device"},
+      {{"mount", "/dev/$HOME"}, 64, "zep: \"/dev/$HOME\" is not a name of a device"},
       {{"mount", "/dev/no-such-device"}, 1, "zep: there is no device /dev/no-such-device"},
-      {{"umount", "/mnt/key;reboot"}, 64, "zep: \"/mnt/key;reboot\" is no mount point of a medium"},
-      {{"umount", "/"}, 64, "zep: \"/\" is no mount point of a medium"},
-      {{"umount", "/home"}, 64, "zep: \"/home\" is no mount point of a medium"},
-      {{"umount", "/mnt/../home"}, 64, "zep: \"/mnt/../home\" is no mount point of a medium"},
-      {{"umount", "/mnt/"}, 64, "zep: \"/mnt\" is no mount point of a medium"},
+      {{"umount", "/mnt/key;reboot"}, 64, "zep: \"/mnt/key;reboot\" is not a mount point of a medium"},
+      {{"umount", "/"}, 64, "zep: \"/\" is not a mount point of a medium"},
+      {{"umount", "/home"}, 64, "zep: \"/home\" is not a mount point of a medium"},
+      {{"umount", "/mnt/../home"}, 64, "zep: \"/mnt/../home\" is not a mount point of a medium"},
+      {{"umount", "/mnt/"}, 64, "zep: \"/mnt\" is not a mount point of a medium"},
       {{"umount", "/mnt/nothing-mounted-here"}, 1, "zep: nothing is mounted at /mnt/nothing-mounted-here\n"},
       {{"umount", "/mnt/nothing-mounted-here/"}, 1, "zep: nothing is mounted at /mnt/nothing-mounted-here\n"},
       {{"mount"}, 64, "zep: device is required"},
@@ -344,7 +344,7 @@ TEST_F(MediaCommandTest, AReportGoesToNoOtherNameThanThatOfADevice) {
   for (char const* name : {"/tmp", "/dev/sdb;x", "key"}) {
     TRun const run = installation_.Run({{"report", "--sample", "--to-media", name}});
     EXPECT_EQ(run.status, 64) << name;
-    EXPECT_THAT(run.errors, HasSubstr("is no name of a device"));
+    EXPECT_THAT(run.errors, HasSubstr("is not a name of a device"));
     EXPECT_EQ(run.output, "");
   }
   TRun const run = installation_.Run({{"report", "--sample", "--to-media", "/dev/no-such-device"}});
