@@ -4,7 +4,6 @@
 #include "ExitStatus.h"
 #include "Json.h"
 #include "Output.h"
-#include "Secrets.h"
 #include "TConfig.h"
 #include "TOSSpecific.h"
 #include "Text.h"
@@ -69,7 +68,6 @@ TSettings ReadSettings() {
   if (IsReadByTheLibrary()) file.open(kFileName);
   std::string text;
   for (std::size_t line = 1; std::getline(file, text); ++line) {
-    HideIn(text);
     std::string const key = text.substr(0, text.find('='));
     std::string const reason = ReasonToIgnore(text, lineOfKey);
     if (reason.empty())

@@ -2,9 +2,14 @@
 
 #include "ControllerSession.h"
 #include "IIPMILan.h"
+#include "Secrets.h"
 #include "TOSSpecific.h"
 #include "Text.h"
 
+#include <arpa/inet.h>
+
+#include <algorithm>
+#include <cctype>
 #include <chrono>
 #include <cstdio>
 #include <vector>
@@ -67,10 +72,18 @@ std::string OrUnknown(std::string const& field) { return field.empty() ? "unknow
 
 }  // namespace
 
-bool IsHostName(std::string const& host) { return host.find('@') == host.npos; }
+bool IsHostName(std::string const& host) {
+  auto const isOfName = [](unsigned char c) { return std::isalnum(c) != 0 || c == '-' || c == '.' || c == '_'; };
+  if (!host.empty() && std::all_of(host.begin(), host.end(), isOfName)) return true;
+  std::size_t const zone = host.find('%');  // "fe80::1%eth0"
+  bool const isZone =
+      zone == host.npos ||
+      (zone + 1 < host.size() && std::all_of(host.begin() + static_cast<std::ptrdiff_t>(zone) + 1, host.end(), isOfName));
+  in6_addr address;
+  return isZone && ::inet_pton(AF_INET6, host.substr(0, zone).c_str(), &address) == 1;
+}
 
 std::string AskController(std::string const& host, TAccount const& account) {
-  if (!IsHostName(host)) return std::string(3, kEnd) + kNoHostName + kEnd;
   auto const start = TClock::now();
   std::string const why = WhyNoSession(host, account);
   if (!why.empty()) return WithoutASession(start, why);
@@ -122,7 +135,7 @@ TJson AsJson(TRemoteIdentity const& identity) {
 
 std::string AsText(TRemoteIdentity const& identity) {
   TTable table({15, 61});
-  table.Add({"Remote server", identity.fHost});
+  table.Add({"Remote server", MessageWithoutSecrets(identity.fHost)});
   table.Add({"Machine type", OrUnknown(identity.fType)});
   table.Add({"Model", OrUnknown(identity.fModel)});
   table.Add({"Serial number", OrUnknown(identity.fSerialNumber)});

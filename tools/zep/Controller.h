@@ -19,11 +19,13 @@ struct TRemoteIdentity {
   std::string fError;                        // why something was not told; empty when all was
 };
 
-// Whether it may be the name or the address of a host: "user:secret@host" is neither.
+// Whether it may be the name or the address of a host: of letters, digits, "-", "." and "_", or an IPv6 address. Neither
+// "user:secret@host" nor "host secret" is one.
 bool IsHostName(std::string const& host);
-constexpr char const* kNoHostName = "a host has no \"@\"; --user names the account, and its password does not belong there";
+constexpr char const* kNoHostName =
+    "not a host name or an address; the account is named by --user, and its password is in --password-file or ZEP_BMC_PASSWORD";
 
-// Asks the controller; to be called in a process of its own. The result is for IdentityFrom.
+// Asks the controller of a host that IsHostName; to be called in a process of its own. The result is for IdentityFrom.
 std::string AskController(std::string const& host, TAccount const& account);
 
 // Puts together what the process said. `isComplete` is false when it did not come to its end.

@@ -9,7 +9,9 @@
 #include "Text.h"
 #include "ValueWords.h"
 
+#include <algorithm>
 #include <cmath>
+#include <iterator>
 
 namespace NQRVZEP20::zep {
 
@@ -50,14 +52,14 @@ TJson PropertyAsJson(TNamespaceView const& view, ICIMInstance const& instance, I
   return json;
 }
 
-// In a message, though not in data, "user:secret@host" has a password.
-bool IsMessage(std::string const& key) { return key == "reason" || key == "error" || key == "failure"; }
+// The members that hold messages, or repeat arguments. All others hold data, which stays as it is.
+bool IsMessage(std::string const& key) {
+  constexpr char const* kMessages[] = {"reason", "error", "failure", "host", "url", "proxy", "command"};
+  return std::find(std::begin(kMessages), std::end(kMessages), key) != std::end(kMessages);
+}
 
 TJson WithoutSecretsIn(TJson json, bool isMessage = false) {
-  if (json.is_string()) {
-    auto const text = json.get<std::string>();
-    return isMessage ? MessageWithoutSecrets(text) : WithoutSecrets(text);
-  }
+  if (json.is_string()) return isMessage ? TJson(MessageWithoutSecrets(json.get<std::string>())) : json;
   if (json.is_object())
     for (auto& [key, value] : json.items()) value = WithoutSecretsIn(std::move(value), IsMessage(key));
   else if (json.is_array())
@@ -75,9 +77,9 @@ TJson DocumentHead(std::string const& what, EExitStatus status, std::string cons
   return document;
 }
 
-std::string AsText(TJson const& document) {
-  return WithoutSecretsIn(document).dump(2, ' ', false, TJson::error_handler_t::replace) + "\n";
-}
+std::string AsText(TJson const& document) { return AsVerbatimText(WithoutSecretsIn(document)); }
+
+std::string AsVerbatimText(TJson const& document) { return document.dump(2, ' ', false, TJson::error_handler_t::replace) + "\n"; }
 
 std::string AsLine(TJson const& document) {
   return WithoutSecretsIn(document).dump(-1, ' ', false, TJson::error_handler_t::replace) + "\n";

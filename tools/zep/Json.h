@@ -22,9 +22,13 @@ constexpr int kDocumentVersion = 2;
 // is not kExitComplete. The reason is empty for kExitComplete, and for nothing else.
 TJson DocumentHead(std::string const& what, EExitStatus status, std::string const& reason);
 
-// A document as text, in lines for people or in one line. Bytes that are not UTF-8 become the replacement character.
+// A document as text, in lines for people or in one line. Bytes that are not UTF-8 become the replacement character. Members that
+// hold a message, such as "reason", or repeat an argument, such as "url", hide passwords (Secrets.h); all others are data.
 std::string AsText(TJson const& document);
 std::string AsLine(TJson const& document);
+
+// The same as AsText, with the messages verbatim too: for a document that is sent or stored.
+std::string AsVerbatimText(TJson const& document);
 
 // The text; null for an empty one.
 TJson OrNull(std::string const& text);

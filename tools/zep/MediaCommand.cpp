@@ -78,7 +78,7 @@ int Mount(std::string const& device, bool asJson) {
   TJson document = DocumentHead("zep media mount", kExitComplete, "");
   document["device"] = medium.Device();
   document["mountPoint"] = medium.MountPoint();
-  WriteOutput(asJson ? zep::AsText(document) : medium.Device() + " is mounted at " + medium.MountPoint() + "\n");
+  WriteMessage(asJson ? zep::AsText(document) : medium.Device() + " is mounted at " + medium.MountPoint() + "\n");
   return kExitComplete;
 }
 
@@ -90,8 +90,8 @@ int Unmount(std::string const& argument, bool asJson) {
   TJson document = DocumentHead("zep media umount", status, why);
   document["mountPoint"] = directory;
   document["stillMountedAt"] = stillMountedAt;
-  WriteOutput(asJson ? zep::AsText(document)
-                     : directory + " is unmounted; the medium " + WhetherToTakeOut(stillMountedAt) + "\n");
+  WriteMessage(asJson ? zep::AsText(document)
+                      : directory + " is unmounted; the medium " + WhetherToTakeOut(stillMountedAt) + "\n");
   return status;
 }
 

@@ -9,6 +9,7 @@
 #include "Json.h"
 #include "MofFile.h"
 #include "Output.h"
+#include "Secrets.h"
 #include "Text.h"
 #include "providers/memory/Mof.h"
 
@@ -99,7 +100,7 @@ std::string AsText(std::string const& file, TCensus const& census) {
 
 std::string AsJson(std::string const& file, TCensus const& census) {
   TJson document = DocumentHead("zep mof", kExitComplete, "");
-  document["file"] = file;
+  document["file"] = MessageWithoutSecrets(file);
   for (TCount const& count : census.Counts()) document[count.fKey] = count.fCount;
   return zep::AsText(document);
 }

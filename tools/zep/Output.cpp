@@ -19,10 +19,11 @@ bool gHasWrittenOutput = false;
 
 void WriteOutput(std::string const& text) {
   gHasWrittenOutput = true;
-  bool const isDocument = !text.empty() && text.front() == '{';
-  if (!WriteWhole(STDOUT_FILENO, isDocument ? text : WithoutSecrets(text)))
+  if (!WriteWhole(STDOUT_FILENO, text))
     throw std::system_error(errno, std::generic_category(), "standard output cannot be written");
 }
+
+void WriteMessage(std::string const& text) { WriteOutput(MessageWithoutSecrets(text)); }
 
 bool HasWrittenOutput() { return gHasWrittenOutput; }
 

@@ -6,12 +6,15 @@
 
 namespace NQRVZEP20::zep {
 
-// Writes the text to standard output, whole but for passwords (WithoutSecrets). A JSON document, which begins with "{", has lost
-// them already (AsText). Throws std::system_error when that fails, as on a full disk; a reader who went away ends the program by
-// SIGPIPE, unless the caller of zep has that signal ignored.
+// Writes the text to standard output, whole and verbatim: values that providers, files and tables report, and documents, whose
+// messages hide passwords already (AsText). Throws std::system_error when that fails, as on a full disk; a reader who went away
+// ends the program by SIGPIPE, unless the caller of zep has that signal ignored.
 void WriteOutput(std::string const& text);
 
-// Whether WriteOutput was called: with --json a document is printed then, in part at least.
+// The same for a text that repeats arguments, which may hold a password (MessageWithoutSecrets).
+void WriteMessage(std::string const& text);
+
+// Whether any of the two was called: with --json a document is printed then, in part at least.
 bool HasWrittenOutput();
 
 // For as long as it lives, what anyone else in this process prints to standard output goes to standard error: plug-ins

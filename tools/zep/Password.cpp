@@ -111,12 +111,12 @@ std::optional<TSecret> AskOnce(std::string const& owner, std::string const& othe
 
 }  // namespace
 
-void TakePasswordOutOfTheEnvironment() {
+void TakePasswordOutOfTheEnvironment(bool isNeeded) {
   std::size_t const length = std::strlen(kVariable);
   for (char** entry = environ; entry != nullptr && *entry != nullptr; ++entry) {
     if (std::strncmp(*entry, kVariable, length) != 0 || (*entry)[length] != '=') continue;
     char* const value = *entry + length + 1;
-    if (!PasswordOfEnvironment()) PasswordOfEnvironment() = TSecret(value);  // the first counts, as for getenv
+    if (isNeeded && !PasswordOfEnvironment()) PasswordOfEnvironment() = TSecret(value);  // the first counts, as for getenv
     Wipe(value, std::strlen(value));
   }
   ::unsetenv(kVariable);

@@ -6,9 +6,9 @@
 
 namespace NQRVZEP20::zep {
 
-// To be called first of all: takes ZEP_BMC_PASSWORD out of the environment, for ControllerPassword, and overwrites it where it
-// stood, so that neither /proc/PID/environ nor a program that zep starts has it.
-void TakePasswordOutOfTheEnvironment();
+// To be called first of all: takes ZEP_BMC_PASSWORD out of the environment and overwrites it where it stood, so that neither
+// /proc/PID/environ nor a program that zep starts has it. It is kept, for ControllerPassword, only where it `isNeeded`.
+void TakePasswordOutOfTheEnvironment(bool isNeeded);
 
 // What is typed at the terminal of the process, without echo, after "Password of ...: ". A signal that ends or stops a
 // program has its effect once the terminal is as it was. Throws std::runtime_error when the input ends, or when there is no

@@ -49,9 +49,9 @@ void TPrivateFile::WarnWhenOthersMayRead() const {
 }
 
 std::string NameOfPrivateFile(std::string const& path, std::string const& option) {
-  bool const isWord = path.find('/') == path.npos && ::access(path.c_str(), F_OK) != 0;
+  bool const isNothing = ::access(path.c_str(), F_OK) != 0;
   int const error = errno;
-  std::string const name = isWord ? "the file of " + option : path;
+  std::string const name = isNothing ? "the file of " + option : path;
   errno = error;
   return name;
 }

@@ -28,7 +28,7 @@ private:
   mode_t fMode = 0;
 };
 
-// A file for messages. A mere word that names nothing may be a password in the place of the file; the option is named instead.
+// A file for messages. What names nothing may be a password in the place of the file; the option is named instead.
 std::string NameOfPrivateFile(std::string const& path, std::string const& option);
 
 }  // namespace NQRVZEP20::zep

@@ -104,7 +104,7 @@ int Tell(std::string const& proxy, TOutcome const& outcome, bool asJson, bool qu
     document["works"] = works;
     WriteOutput(AsText(document));
   } else if (works && !quiet) {
-    WriteOutput("The proxy " + proxy + " lets requests through.\n");
+    WriteMessage("The proxy " + proxy + " lets requests through.\n");
   }
   if (!works) std::cerr << "zep: proxy " << proxy << ": " << outcome.fReason << "\n";
   return outcome.fExit;

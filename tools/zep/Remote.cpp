@@ -34,7 +34,7 @@ void CheckPort(std::string const& port) {
 void ReadUser(std::string const& text, TRemote& remote) {
   std::size_t const colon = text.find(':');
   remote.fUser = Decoded(text.substr(0, colon));
-  if (colon != text.npos) remote.fPassword = TSecret(Decoded(std::string_view(text).substr(colon + 1)));
+  if (colon != text.npos) remote.fPassword = SecretOf(Decoded(std::string_view(text).substr(colon + 1)));
 }
 
 void ReadAuthority(std::string const& text, TRemote& remote) {
@@ -56,7 +56,7 @@ void CheckForPassword(std::string const& authority, std::string const& path) {
   bool const hasPort = authority.find(':', authority.front() == '[' ? authority.find(']') : 0) != authority.npos;
   bool const hasUser = authority.find('@') != authority.npos;
   if (hasPort && !hasUser && path.find('@') != path.npos)
-    throw TWrongUsage("is that a password? A \"/\" in one is written %2F, an \"@\" in a path %40");
+    throw TWrongUsage("the first \"/\" comes before an \"@\": write a \"/\" in a password as %2F, an \"@\" in a path as %40");
 }
 
 // ---- Passwords ----

@@ -30,6 +30,8 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
+using namespace std::string_literals;
+
 struct TArguments {
   std::string fHost, fHostsFile, fUser, fPasswordFile, fDebugLog;
   int fParallel = 32;
@@ -37,16 +39,20 @@ struct TArguments {
   bool fAsJson = false;
 };
 
-// The lines of the file that are neither empty nor comments, without blanks around them.
+// The lines of the file that are neither empty nor comments, without blanks around them. One that is not a host may hold a
+// password, and is not repeated.
 std::vector<std::string> HostsIn(std::string const& path) {
   errno = 0;
   std::ifstream file(path);
   std::vector<std::string> hosts;
+  std::size_t number = 0;
   for (std::string line; std::getline(file, line);) {
+    ++number;
     std::size_t const first = line.find_first_not_of(" \t\r");
     if (first == line.npos || line[first] == '#') continue;
     hosts.push_back(line.substr(first, line.find_last_not_of(" \t\r") + 1 - first));
-    HideIn(hosts.back());
+    if (!IsHostName(hosts.back()))
+      throw std::runtime_error("line " + std::to_string(number) + " of " + Printable(path) + ": " + kNoHostName);
   }
   bool const isRead = file.is_open() && !file.bad();  // to its end
   if (!isRead) throw std::runtime_error(Printable(path) + " cannot be read: " + std::strerror(errno));
@@ -105,11 +111,6 @@ void WriteDebugLog(std::string const& path) {
   TLogger::SetLogThreshold(ILogger::kLogDebug);
 }
 
-void WarnOfPasswords() {
-  if (TLogger::GetInstance()->GetLogThreshold() < ILogger::kLogDebug) return;
-  std::cerr << "zep: warning: debug lines are logged, and the controller link writes passwords among them in clear text\n";
-}
-
 using TReport = std::function<void(TRemoteIdentity const&)>;
 
 // Asks the controller of each host, and reports each as soon as it is known. Returns an EExitStatus.
@@ -154,12 +155,11 @@ void HideAfterColon(std::string const& user) {
 int Remote(TArguments const& arguments) {
   if (arguments.fHost.empty() == arguments.fHostsFile.empty())
     throw TWrongUsage("name either a host or a file of hosts (--hosts)");
-  if (!IsHostName(arguments.fHost)) throw TWrongUsage(kNoHostName);
+  if (!arguments.fHost.empty() && !IsHostName(arguments.fHost)) throw TWrongUsage("the host is "s + kNoHostName);
   HideAfterColon(arguments.fUser);
   std::vector<std::string> const hosts =
       arguments.fHostsFile.empty() ? std::vector<std::string>() : HostsIn(arguments.fHostsFile);
   if (!arguments.fDebugLog.empty()) WriteDebugLog(arguments.fDebugLog);
-  WarnOfPasswords();
   TAccount const account = {arguments.fUser, ControllerPassword(arguments.fUser, arguments.fPasswordFile)};
   return arguments.fHostsFile.empty() ? AskOne(account, arguments) : AskList(hosts, account, arguments);
 }

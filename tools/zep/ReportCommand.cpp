@@ -53,7 +53,7 @@ std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::stri
 // Returns the document that tells of it.
 TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
   std::string const name = ReportFileName(report, arguments.fAsJson ? ".json" : ".txt");
-  std::string const text = arguments.fAsJson ? AsText(ReportAsJson(report)) : ReportAsText(report);
+  std::string const text = arguments.fAsJson ? AsVerbatimText(ReportAsJson(report)) : ReportAsText(report);
   TMountedMedium const medium(arguments.fMedium);
   std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);
 
@@ -63,7 +63,7 @@ TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
   document["bytes"] = text.size();
   document["stillMountedAt"] = stillMountedAt;
   if (!arguments.fAsJson)
-    WriteOutput("The report is " + name + " on " + medium.Device() + ", which " + WhetherToTakeOut(stillMountedAt) + ".\n");
+    WriteMessage("The report is " + name + " on " + medium.Device() + ", which " + WhetherToTakeOut(stillMountedAt) + ".\n");
   return document;
 }
 

@@ -1,5 +1,6 @@
 #include "Report.h"
 #include "Sample.h"
+#include "Secrets.h"
 #include "Text.h"
 
 #include <cstdio>
@@ -12,7 +13,7 @@ std::string Title(std::string const& title) { return IsSampleSelected() ? std::s
 
 std::string ValueOf(TAnswer const& answer) {
   if (answer.fIsKnown) return answer.fValue + (answer.fNote.empty() ? "" : " (" + answer.fNote + ")");
-  return (answer.IsNotApplicable() ? "none: " : "unknown: ") + answer.fMissing.fReason;
+  return (answer.IsNotApplicable() ? "none: " : "unknown: ") + MessageWithoutSecrets(answer.fMissing.fReason);
 }
 
 std::string RowsAsText(std::string const& title, std::vector<TReportRow> const& rows) {
@@ -32,13 +33,13 @@ std::string AsMilliseconds(double milliseconds) {
 }
 
 std::string WhatHappened(TPlugIn const& plugIn) {
-  if (!plugIn.fError.empty()) return "failed: " + plugIn.fError;
+  if (!plugIn.fError.empty()) return "failed: " + MessageWithoutSecrets(plugIn.fError);
   if (plugIn.fProviders.empty()) return "loaded, but registered no provider of its own";
   std::string text;
   for (TProviderRun const& provider : plugIn.fProviders) {
     if (!text.empty()) text += "; ";
     text += provider.fError.empty() ? "filled " + provider.fView->GetName()
-                                    : "provider " + provider.fName + " failed: " + provider.fError;
+                                    : "provider " + provider.fName + " failed: " + MessageWithoutSecrets(provider.fError);
   }
   return text;
 }

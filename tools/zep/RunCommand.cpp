@@ -54,7 +54,7 @@ std::string WhyItFailed(std::string const& program, int timeout) {
 std::string AsJson(std::vector<std::string> const& commandLine, std::string const& output, std::string const& failure) {
   TJson document = DocumentHead("zep run", failure.empty() ? kExitComplete : kExitNothing, failure);
   document["command"] = commandLine;
-  document["output"] = output;
+  document["output"] = WithoutSecrets(output);
   return AsText(document);
 }
 

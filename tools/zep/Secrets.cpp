@@ -35,9 +35,16 @@ void Add(std::string_view secret) {
   secrets.insert(std::find_if(secrets.begin(), secrets.end(), isShorter), std::move(bytes));
 }
 
+// The form of a secret, which is overwritten.
+void AddForm(std::string&& form) {
+  Add(form);
+  Wipe(form.data(), form.size());
+}
+
 std::string Base64Of(std::string_view text) {
   constexpr char const* kDigits = "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789+/";
   std::string encoded;
+  encoded.reserve((text.size() + 2) / 3 * 4);  // so that it leaves no piece elsewhere
   for (std::size_t at = 0; at < text.size(); at += 3) {
     auto const byte = [&](std::size_t i) { return i < text.size() ? static_cast<unsigned char>(text[i]) : 0u; };
     unsigned const bits = byte(at) << 16 | byte(at + 1) << 8 | byte(at + 2);
@@ -170,12 +177,16 @@ TErrorBuffer& ErrorBuffer() {
 
 void Hide(std::string_view secret) {
   Add(secret);
-  Add(Encoded(secret, ""));
-  Add(Printable(secret));
+  AddForm(Encoded(secret, ""));
+  AddForm(Printable(secret));
 }
 
 void HideLogin(std::string_view user, std::string_view password) {
-  if (!password.empty()) Add(Base64Of(std::string(user) + ":" + std::string(password)));
+  if (password.empty()) return;
+  TSecretBytes login(user.begin(), user.end());
+  login.push_back(':');
+  login.insert(login.end(), password.begin(), password.end());
+  AddForm(Base64Of({login.data(), login.size()}));
 }
 
 void HideIn(std::string_view word) {
@@ -183,7 +194,7 @@ void HideIn(std::string_view word) {
   TSpan span = start > 0 ? SpanInPlace(word.substr(start)) : SpanInBareWord(word);
   if (span.fSize == 0) return;
   std::string_view const secret = word.substr(start + span.fStart, span.fSize);
-  TSecret const hidden(secret), decoded(Decoded(secret));
+  TSecret const hidden(secret), decoded = SecretOf(Decoded(secret));
   // Taken for a path, one with a "/" in it comes back in pieces.
   std::size_t const slash = secret.rfind('/');
   if (slash != secret.npos) TSecret const piece(secret.substr(slash + 1));

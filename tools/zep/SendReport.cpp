@@ -16,7 +16,7 @@ namespace {
 
 void WriteReport(TReport const& report, std::string const& file) {
   std::ofstream stream(file, std::ios::binary);
-  stream << Gzipped(AsText(ReportAsJson(report)));
+  stream << Gzipped(AsVerbatimText(ReportAsJson(report)));
   stream.close();
   if (!stream) throw std::system_error(errno, std::generic_category(), file);
 }

@@ -15,4 +15,10 @@ TSecret::TSecret(std::string_view text) : fBytes(text.begin(), text.end()) {
   Hide(text);
 }
 
+TSecret SecretOf(std::string&& text) {
+  TSecret secret{std::string_view(text)};
+  Wipe(text.data(), text.size());
+  return secret;
+}
+
 }  // namespace NQRVZEP20::zep

@@ -11,19 +11,24 @@ namespace NQRVZEP20::zep {
 // Overwrites the bytes, which the compiler does not leave out.
 void Wipe(void* bytes, std::size_t size);
 
+struct THeap {
+  static void* Take(std::size_t size) { return ::operator new(size); }
+  static void GiveBack(void* memory, std::size_t) { ::operator delete(memory); }
+};
+
 // Memory that is overwritten before it is given back.
-template <class T>
+template <class T, class TUpstream = THeap>
 struct TWipingAllocator {
   using value_type = T;
 
   TWipingAllocator() = default;
   template <class TOther>
-  TWipingAllocator(TWipingAllocator<TOther> const&) {}
+  TWipingAllocator(TWipingAllocator<TOther, TUpstream> const&) {}
 
-  T* allocate(std::size_t count) { return static_cast<T*>(::operator new(count * sizeof(T))); }
+  T* allocate(std::size_t count) { return static_cast<T*>(TUpstream::Take(count * sizeof(T))); }
   void deallocate(T* memory, std::size_t count) {
     Wipe(memory, count * sizeof(T));
-    ::operator delete(memory);
+    TUpstream::GiveBack(memory, count * sizeof(T));
   }
   bool operator==(TWipingAllocator const&) const { return true; }
   bool operator!=(TWipingAllocator const&) const { return false; }
@@ -49,5 +54,8 @@ public:
 private:
   TSecretBytes fBytes;
 };
+
+// The secret in an ordinary text, which is overwritten.
+TSecret SecretOf(std::string&& text);
 
 }  // namespace NQRVZEP20::zep

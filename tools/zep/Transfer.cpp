@@ -4,6 +4,7 @@
 #include "Failure.h"
 #include "FileTransfer.h"
 #include "Output.h"
+#include "Secrets.h"
 #include "Sha256.h"
 #include "TChildProcess.h"
 #include "Terminal.h"
@@ -409,7 +410,7 @@ TJson DocumentOf(TTransferred const& transferred, std::string const& command) {
   bool const isComplete = transferred.fOutcome.fExit == kExitComplete;
   TJson document = DocumentHead(command, transferred.fOutcome.fExit, transferred.fOutcome.fReason);
   document["url"] = transferred.fUrl;
-  document["file"] = transferred.fFile;
+  document["file"] = MessageWithoutSecrets(transferred.fFile);
   document["bytes"] = isComplete ? TJson(transferred.fBytes) : TJson(nullptr);
   document["sha256"] = isComplete ? TJson(transferred.fSha256) : TJson(nullptr);
   if (command == "zep send") document["leftOnServer"] = transferred.fLeftOnServer;
@@ -422,8 +423,8 @@ int TellOf(TTransferred const& transferred, std::string const& command, bool asJ
   if (asJson) {
     WriteOutput(AsText(DocumentOf(transferred, command)));
   } else if (isComplete && !options.fQuiet) {
-    WriteOutput(transferred.fUrl + ", " + Printable(transferred.fFile) + ": " + std::to_string(transferred.fBytes) +
-                " bytes, SHA-256 " + transferred.fSha256 + "\n");
+    WriteMessage(transferred.fUrl + ", " + Printable(transferred.fFile) + ": " + std::to_string(transferred.fBytes) +
+                 " bytes, SHA-256 " + transferred.fSha256 + "\n");
   }
   WarnOfLeft(transferred);
   if (!isComplete)

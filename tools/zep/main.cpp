@@ -9,11 +9,11 @@
 #include "Secrets.h"
 #include "Text.h"
 
+#include <signal.h>
 #include <CLI/CLI.hpp>
 
 #include <algorithm>
 #include <cctype>
-#include <csignal>
 #include <exception>
 #include <iostream>
 #include <map>
@@ -178,9 +178,14 @@ int Run(CLI::App& app, TRuns const& runs, std::vector<std::string> const& words)
   return runs.at(app.get_subcommands().front())();
 }
 
+// "zep remote" uses it; what "zep run" runs may print it, from elsewhere.
+bool IsControllersPasswordNeeded(std::vector<std::string> const& words) {
+  return std::any_of(words.begin(), words.end(), [](std::string const& word) { return word == "remote" || word == "run"; });
+}
+
 // Before anything else, and anything that might be printed.
 void KeepSecrets(std::vector<std::string> const& words) {
-  TakePasswordOutOfTheEnvironment();
+  TakePasswordOutOfTheEnvironment(IsControllersPasswordNeeded(words));
   static TGuardedErrors const errors;  // to the end of the program
   for (std::string const& word : words) HideIn(word);
 }
@@ -213,9 +218,16 @@ void WriteFailure(std::string const& document, std::exception const& failure) {
   if (!why.empty()) std::cerr << "zep: " << Printable(why) << '\n';
 }
 
-// A caller that ignores SIGCHLD, as some services do, passes that on, and the result of no child could be had. SIGPIPE stays as
-// the caller has it (Output.h).
-void SetSignals() { std::signal(SIGCHLD, SIG_DFL); }
+// A caller that ignores SIGCHLD, as some services do, passes that on, and the result of no child could be had. One that blocks
+// the signals that end a program passes that on too, and nothing but SIGKILL would end zep. SIGPIPE stays as the caller has it
+// (Output.h).
+void SetSignals() {
+  ::signal(SIGCHLD, SIG_DFL);
+  sigset_t signals;
+  ::sigemptyset(&signals);
+  for (int const signal : {SIGINT, SIGTERM, SIGHUP, SIGCHLD}) ::sigaddset(&signals, signal);
+  ::sigprocmask(SIG_UNBLOCK, &signals, nullptr);
+}
 
 int RunOrFail(std::vector<std::string> const& words) {
   CLI::App app("zep tells what a server knows of itself, through the provider plug-ins beside libzepcore.so.", "zep");

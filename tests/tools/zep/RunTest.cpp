@@ -3,6 +3,7 @@
 #include "tests/tools/zep/Zep.h"
 
 #include <gtest/gtest.h>
+#include <signal.h>
 
 #include <chrono>
 
@@ -80,6 +81,31 @@ TEST_F(RunTest, ACallerThatIgnoresItsChildrenMakesNoDifference) {
   TRun const run = zep_.Run(call);
   EXPECT_EQ(run.status, 0) << run.errors;
   EXPECT_EQ(run.output, "done\n");
+}
+
+// Blocks them for this process and its children.
+class TBlockedSignals {
+public:
+  TBlockedSignals() {
+    sigset_t signals;
+    ::sigemptyset(&signals);
+    for (int const signal : {SIGINT, SIGTERM, SIGHUP, SIGCHLD}) ::sigaddset(&signals, signal);
+    ::sigprocmask(SIG_BLOCK, &signals, &fBefore);
+  }
+  ~TBlockedSignals() { ::sigprocmask(SIG_SETMASK, &fBefore, nullptr); }
+  TBlockedSignals(TBlockedSignals const&) = delete;
+  TBlockedSignals& operator=(TBlockedSignals const&) = delete;
+
+private:
+  sigset_t fBefore{};
+};
+
+TEST_F(RunTest, ACallerThatBlocksSignalsDoesNotKeepItFromEnding) {
+  TBlockedSignals const blocked;
+  for (int const signal : {SIGTERM, SIGINT, SIGHUP}) {
+    TCall call = {{"run", "--timeout", "20", "sh", "-c", "kill -" + std::to_string(signal) + " $PPID; exec sleep 1"}};
+    EXPECT_EQ(zep_.Run(call).status, 128 + signal);
+  }
 }
 
 TEST_F(RunTest, TheTimeoutIsOneOfSilence) {
