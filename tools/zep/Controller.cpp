@@ -84,6 +84,7 @@ bool IsHostName(std::string const& host) {
 }
 
 std::string AskController(std::string const& host, TAccount const& account) {
+  if (!IsHostName(host)) return std::string(3, kEnd) + kNoHostName + kEnd;
   auto const start = TClock::now();
   std::string const why = WhyNoSession(host, account);
   if (!why.empty()) return WithoutASession(start, why);

@@ -25,7 +25,8 @@ bool IsHostName(std::string const& host);
 constexpr char const* kNoHostName =
     "not a host name or an address; the account is named by --user, and its password is in --password-file or ZEP_BMC_PASSWORD";
 
-// Asks the controller of a host that IsHostName; to be called in a process of its own. The result is for IdentityFrom.
+// Asks the controller; to be called in a process of its own. What is not a host name is not asked. The result is for
+// IdentityFrom.
 std::string AskController(std::string const& host, TAccount const& account);
 
 // Puts together what the process said. `isComplete` is false when it did not come to its end.

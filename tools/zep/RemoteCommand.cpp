@@ -40,7 +40,7 @@ struct TArguments {
 };
 
 // The lines of the file that are neither empty nor comments, without blanks around them. One that is not a host may hold a
-// password, and is not repeated.
+// password: its place is reported instead.
 std::vector<std::string> HostsIn(std::string const& path) {
   errno = 0;
   std::ifstream file(path);
@@ -50,9 +50,8 @@ std::vector<std::string> HostsIn(std::string const& path) {
     ++number;
     std::size_t const first = line.find_first_not_of(" \t\r");
     if (first == line.npos || line[first] == '#') continue;
-    hosts.push_back(line.substr(first, line.find_last_not_of(" \t\r") + 1 - first));
-    if (!IsHostName(hosts.back()))
-      throw std::runtime_error("line " + std::to_string(number) + " of " + Printable(path) + ": " + kNoHostName);
+    std::string const host = line.substr(first, line.find_last_not_of(" \t\r") + 1 - first);
+    hosts.push_back(IsHostName(host) ? host : "line " + std::to_string(number) + " of " + Printable(path));
   }
   bool const isRead = file.is_open() && !file.bad();  // to its end
   if (!isRead) throw std::runtime_error(Printable(path) + " cannot be read: " + std::strerror(errno));

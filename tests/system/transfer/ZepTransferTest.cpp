@@ -213,7 +213,7 @@ TEST_F(ZepTransferTest, ArgumentsInTheWrongOrderAreNotRepeated) {
     EXPECT_THAT(run.output, Not(HasSubstr("topsecret")));
   }
   EXPECT_EQ(Zep("send --netrc /nowhere " + Local("f", "text") + " ftp://zep@127.0.0.1/x").output,
-            "zep: /nowhere: No such file or directory\n");
+            "zep: the file of --netrc: No such file or directory\n");
 }
 
 TEST_F(ZepTransferTest, ABrokenDownloadIsMarked) {
