@@ -169,6 +169,7 @@ private:
 };
 
 TErrorBuffer& ErrorBuffer() {
+  AllSecrets();  // made first, so that it outlives the buffer, which looks at it at the end of the program
   static TErrorBuffer buffer;
   return buffer;
 }
