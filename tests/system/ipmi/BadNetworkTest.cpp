@@ -7,6 +7,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <memory>
 #include <random>
 #include <set>
 
@@ -39,7 +40,7 @@ protected:
     simulator_->WaitUntilReady();
   }
 
-  // Puts a network in front of the controller.
+  // Puts a network between the client and the controller. The rule lives longer than the test's own variables.
   void Relay(EVersion version, TRelay::TRule const& rule) {
     relay_.reset();
     relay_.emplace(623, kControllersPort, [version, rule](TRelay::TDatagram& datagram) {
@@ -85,7 +86,7 @@ TEST_P(MishapTest, IsGotOverInEveryPlace) {
   for (bool const isAnswer : {false, true})
     for (int place = 0; place < places; ++place) {
       SCOPED_TRACE((isAnswer ? "answer " : "request ") + std::to_string(place));
-      Relay(mishap.version, [&](TRelay::TDatagram const& datagram) {
+      Relay(mishap.version, [&mishap, isAnswer, place](TRelay::TDatagram const& datagram) {
         return datagram.isAnswer == isAnswer && datagram.place == place ? mishap.fate : TRelay::AtOnce();
       });
       EXPECT_EQ(client_.Open(623), kIpmiClientOk);
@@ -141,8 +142,7 @@ TEST_F(BadNetworkTest, BothWaysMayTake3Seconds) {
 TEST_P(EachVersionTest, AFifthMayBeLostAndAFifthDoubledAndAllOvertakeOneAnother) {
   for (unsigned seed : {1u, 2u}) {
     SCOPED_TRACE(seed);
-    std::mt19937 random(seed);
-    Relay(GetParam(), [&](auto const&) {
+    Relay(GetParam(), [random = std::mt19937(seed)](auto const&) mutable {
       unsigned const lot = random() % 5;
       std::chrono::milliseconds const delay(random() % 200), another(random() % 200);
       return lot == 0 ? TFate{} : lot == 1 ? TFate{delay, another} : TFate{delay};
@@ -155,8 +155,9 @@ TEST_P(EachVersionTest, AFifthMayBeLostAndAFifthDoubledAndAllOvertakeOneAnother)
 }
 
 TEST_F(BadNetworkTest, AFifthMayBeLostWhereAnswersTake3Seconds) {
-  std::mt19937 random(7);
-  Relay(kVersion2, [&](auto const& datagram) { return random() % 5 == 0 ? TFate{} : TFate{datagram.isAnswer ? 3000ms : 0ms}; });
+  Relay(kVersion2, [random = std::mt19937(7)](auto const& datagram) mutable {
+    return random() % 5 == 0 ? TFate{} : TFate{datagram.isAnswer ? 3000ms : 0ms};
+  });
   ASSERT_EQ(client_.Open(623), kIpmiClientOk);
   EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
 }
@@ -179,8 +180,7 @@ std::vector<std::string> OfCommand(std::vector<std::string> datagrams, char comm
 
 TEST_F(BadNetworkTest, ACommandThatIsSentAgainHasTheSameRequestNumber) {
   constexpr char kAddEvent = 0x44;
-  int answers = 0;
-  Relay(kVersion15, [&](auto const& datagram) {
+  Relay(kVersion15, [answers = 0](auto const& datagram) mutable {
     bool const isLost = datagram.isAnswer && IsOfCommand(datagram.bytes, kAddEvent) && ++answers <= 2;
     return isLost ? TFate{} : TRelay::AtOnce();
   });
@@ -230,8 +230,7 @@ TEST_F(BadNetworkTest, AnEchoInEveryLaterPlaceMakesNoSenseEither) {
   int const placeOfCommand = PlacesIn(kVersion2) - 2;
   for (int place = 1; place < placeOfCommand; ++place) {
     SCOPED_TRACE(place);
-    std::string request;
-    Relay(kVersion2, [&](TRelay::TDatagram& datagram) {
+    Relay(kVersion2, [place, request = std::string()](TRelay::TDatagram& datagram) mutable {
       if (!datagram.isAnswer) request = datagram.bytes;
       if (datagram.isAnswer && datagram.place >= place) datagram.bytes = request;
       return TRelay::AtOnce();
@@ -256,14 +255,14 @@ TEST_F(BadNetworkTest, APrivilegeThatALateCopyTookAwayIsAskedForAgain) {
 // The controller refuses a proof that does not fit the random number it holds: as after a copy of the step before.
 TEST_F(BadNetworkTest, AnOpeningThatGotOutOfStepIsBegunAnew) {
   constexpr char kProof = 0x14;  // RAKP message 3
-  std::atomic<int> proofs{0};
-  Relay(kVersion2, [&](TRelay::TDatagram& datagram) {
-    bool const isFirst = !datagram.isAnswer && datagram.bytes[5] == kProof && proofs++ == 0;
+  auto const proofs = std::make_shared<std::atomic<int>>(0);
+  Relay(kVersion2, [proofs](TRelay::TDatagram& datagram) {
+    bool const isFirst = !datagram.isAnswer && datagram.bytes[5] == kProof && (*proofs)++ == 0;
     if (isFirst) datagram.bytes.back() = static_cast<char>(datagram.bytes.back() ^ 1);
     return TRelay::AtOnce();
   });
   EXPECT_EQ(client_.Open(623), kIpmiClientOk);
-  EXPECT_GE(proofs, 2);
+  EXPECT_GE(*proofs, 2);
   EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
 }
 
