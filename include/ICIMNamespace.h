@@ -21,7 +21,7 @@ public:
   virtual boost::shared_ptr<ICIMClass> CreateClass(boost::shared_ptr<ICIMClass> superClass, std::string const& name,
                                                    TCIMContext const& context) = 0;
 
-  // Throws kZEPStatusNotFound when there is no class of that name.
+  // Throws kZEPStatusNotFound when the namespace has no class with that name.
   virtual boost::shared_ptr<ICIMClass> GetClass(std::string const& className, TCIMContext const& context) const = 0;
 
   // Visits the root classes, in the order in which they were created. ICIMClass::EnumerateSubClasses of each root class

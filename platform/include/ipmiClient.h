@@ -29,7 +29,7 @@ enum {
   kIpmiClientOk = 0,
   kIpmiClientWrongPassword = 1,
   kIpmiClientUnknownUser = 2,     /* or one that is disabled */
-  kIpmiClientNoAnswer = 3,        /* the controller is silent, or nobody listens; see SendIpmiCommand */
+  kIpmiClientNoAnswer = 3,        /* the controller is silent, or its port is closed; see SendIpmiCommand */
   kIpmiClientHostUnknown = 4,     /* the host name has no address */
   kIpmiClientUnreachable = 5,     /* the system cannot send there */
   kIpmiClientBusy = 6,            /* the controller has no session left */

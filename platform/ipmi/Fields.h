@@ -21,7 +21,7 @@ public:
   // Empty fields of that form. Throws std::bad_alloc.
   explicit TFields(fiid_field_t* form);
 
-  // Fields with these bytes. Bytes behind the form's end are ignored.
+  // Fields with these bytes. Bytes after the end of the form are ignored.
   TFields(fiid_field_t* form, TByteVector const& bytes);
 
   // Nothing when the fields end before it.

@@ -1,4 +1,4 @@
-// Opening a session of version 1.5: the controller sends a challenge, which comes back signed with the password.
+// Opening a session of version 1.5: the controller sends a challenge, and the client returns it signed with the password.
 
 #include "platform/include/ipmiClient.h"
 #include "platform/ipmi/Failure.h"

@@ -45,7 +45,7 @@ void RaisePrivilege(TLink& link, IEnvelope& envelope, TWaits const& waits, TCloc
 std::unique_ptr<IEnvelope> OpenVersion2(TOpening const& opening, TWay const& way);
 std::unique_ptr<IEnvelope> OpenVersion15(TOpening const& opening);
 
-// A number that nobody can guess; not 0.
+// An unpredictable number other than 0.
 std::uint32_t RandomNumber();
 
 }  // namespace ipmi

@@ -37,11 +37,11 @@ public:
   // send there.
   void Send(TPacket const& packet);
 
-  // The next packet. Nothing when there is none until then, or as soon as NobodyListens. Longer ones than any controller
-  // sends come back empty.
+  // Returns the next packet; nothing when none is received by `until`, or as soon as NobodyListens. A packet longer than any
+  // that controllers send is returned empty.
   std::optional<TPacket> Receive(TClock::time_point until);
 
-  // Whether the host said that nobody listens on the port, and no packet came before that.
+  // Whether the host reported the port as closed before any packet was received.
   bool NobodyListens() const { return fIsRefused && !fHasReceived; }
 
   // The number of the next request, from 0 to 63 and over again.

@@ -19,7 +19,7 @@ public:
 
 private:
   struct TNull {};                           // of no class
-  using TStrings = std::unique_ptr<char[]>;  // how many, and each behind its length; all numbers of four bytes
+  using TStrings = std::unique_ptr<char[]>;  // the count, then each text after its length; numbers of four bytes
 
   TCIMValue::TCIMType fType;
   unsigned int fMaxArraySize;

@@ -186,10 +186,10 @@ TEST(SmbiosTableTest, AnEntryPointNamesTheTable) {
       {"32 bits, the file ends in the table", EntryPoint32(table.size()) + table.substr(0, 100), table.substr(0, 100)},
       {"32 bits, a table of one byte", EntryPoint32(1) + table, table.substr(0, 1)},
       {"before 2.1", EntryPointLegacy(table.size()) + table, table},
-      {"before 2.1, the table right behind", EntryPointLegacy(table.size(), 15).substr(0, 15) + table, table},
+      {"before 2.1, the table right after it", EntryPointLegacy(table.size(), 15).substr(0, 15) + table, table},
       {"before 2.1, the file ends in the table", EntryPointLegacy(table.size()) + table.substr(0, 100), table.substr(0, 100)},
       {"64 bits", EntryPoint64(table.size()) + table, table},
-      {"64 bits, the table right behind", EntryPoint64(table.size(), 24).substr(0, 24) + table, table},
+      {"64 bits, the table right after it", EntryPoint64(table.size(), 24).substr(0, 24) + table, table},
       {"64 bits, the largest size there is", EntryPoint64(0xFFFFFFFF) + table, table},
   };
   for (TRow const& row : rows) {
@@ -215,7 +215,7 @@ TEST(SmbiosTableTest, AnEntryPointThatCannotBeRightNamesNothing) {
   TRow const rows[] = {
       {"32 bits: the anchor alone", "_SM_"},
       {"32 bits: cut inside", sound32.substr(0, 31)},
-      {"32 bits: no table behind", EntryPoint32(table.size())},
+      {"32 bits: no table after it", EntryPoint32(table.size())},
       {"32 bits: checksum", with(sound32, 8, 1)},
       {"32 bits: inner anchor", innerAnchorSumsUp},
       {"32 bits: inner checksum", innerSumWrong},
@@ -225,7 +225,7 @@ TEST(SmbiosTableTest, AnEntryPointThatCannotBeRightNamesNothing) {
       {"32 bits: table behind the file", EntryPoint32(table.size(), 32 + table.size() + 1) + table},
       {"32 bits: highest address", EntryPoint32(table.size(), 0xFFFFFFFF) + table},
       {"32 bits: size 0", EntryPoint32(0) + table},
-      {"before 2.1: no table behind", EntryPointLegacy(table.size())},
+      {"before 2.1: no table after it", EntryPointLegacy(table.size())},
       {"before 2.1: table inside the entry point", EntryPointLegacy(table.size(), 14) + table},
       {"before 2.1: highest address", EntryPointLegacy(table.size(), 0xFFFFFFFF) + table},
       {"before 2.1: size 0", EntryPointLegacy(0) + table},
