@@ -10,8 +10,8 @@
 #include "ICIMPropertyDecl.h"
 #include "ICIMQualifier.h"
 #include "TCIMCopy.h"
-#include "providers/memory/Mof.h"
 #include "providers/memory/TMemoryNamespace.h"
+#include "providers/mof/Mof.h"
 
 #include <benchmark/benchmark.h>
 #include <malloc.h>

@@ -1,8 +1,8 @@
 // Reads any text as MOF. The text must be refused with a position, or, once written as MOF, read back as the same.
 
-#include "providers/memory/Mof.h"
 #include "providers/memory/TMemoryNamespace.h"
-#include "providers/memory/TMofError.h"
+#include "providers/mof/Mof.h"
+#include "providers/mof/TMofError.h"
 
 #include <boost/make_shared.hpp>
 

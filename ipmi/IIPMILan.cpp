@@ -1,8 +1,8 @@
 #include "IIPMILan.h"
 
-#include "core/IpmiLibrary.h"
 #include "core/Log.h"
-#include "ipmi/UsbLan.h"
+#include "loaders/IpmiLibrary.h"
+#include "loaders/UsbLan.h"
 
 #include <unistd.h>
 

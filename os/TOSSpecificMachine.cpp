@@ -3,11 +3,11 @@
 #include "TLogger.h"
 #include "TZEPStatusCode.h"
 #include "core/Handles.h"
-#include "core/IpmiLibrary.h"
 #include "core/Log.h"
+#include "loaders/IpmiLibrary.h"
+#include "loaders/SmbiosLibrary.h"
 #include "os/LocalTime.h"
 #include "os/MachineIdentity.h"
-#include "os/SmbiosLibrary.h"
 
 #include <algorithm>
 #include <array>

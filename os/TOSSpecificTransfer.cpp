@@ -2,7 +2,7 @@
 #include "TZEPException.h"
 #include "core/Handles.h"
 #include "core/Log.h"
-#include "os/CurlLibrary.h"
+#include "loaders/CurlLibrary.h"
 
 #include <fcntl.h>
 #include <netdb.h>

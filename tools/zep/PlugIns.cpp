@@ -1,12 +1,12 @@
 #include "PlugIns.h"
 
-#include "Failure.h"
 #include "ILogger.h"
 #include "INamespaceProvider.h"
-#include "Output.h"
 #include "TOSSpecific.h"
 #include "TRootObject.h"
-#include "Text.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/Text.h"
 
 #include <algorithm>
 #include <chrono>

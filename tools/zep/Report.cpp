@@ -1,13 +1,13 @@
 #include "Report.h"
 
-#include "Failure.h"
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
 #include "ICIMProperty.h"
 #include "Sample.h"
 #include "TCIMSchemaHelper.h"
 #include "TZEPException.h"
-#include "Text.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Text.h"
 
 #include <algorithm>
 #include <cctype>

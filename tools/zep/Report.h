@@ -1,9 +1,9 @@
 #pragma once
 
-#include "ExitStatus.h"
-#include "Json.h"
 #include "PlugIns.h"
 #include "TNamespaceView.h"
+#include "tools/zep/output/ExitStatus.h"
+#include "tools/zep/output/Json.h"
 
 #include <string>
 #include <vector>

@@ -8,7 +8,7 @@
 #include "Sample.h"
 #include "TAddToVectorCallback.h"
 #include "TZEPException.h"
-#include "Text.h"
+#include "tools/zep/output/Text.h"
 
 #include <algorithm>
 

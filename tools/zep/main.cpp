@@ -1,13 +1,13 @@
 // zep: the reference front end. One program with subcommands, each in a file of its own.
 
-#include "Commands.h"
-#include "ExitStatus.h"
-#include "Failure.h"
-#include "Json.h"
-#include "Output.h"
-#include "Password.h"
-#include "Secrets.h"
-#include "Text.h"
+#include "tools/zep/commands/Commands.h"
+#include "tools/zep/output/ExitStatus.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Json.h"
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/secrets/Password.h"
+#include "tools/zep/secrets/Secrets.h"
 
 #include <signal.h>
 #include <CLI/CLI.hpp>

@@ -4,7 +4,7 @@
 #include "TCIMCopy.h"
 #include "TCIMSchemaHelper.h"
 #include "TableModel.h"
-#include "providers/memory/Mof.h"
+#include "providers/mof/Mof.h"
 #include "tests/providers/memory/Collect.h"
 
 #include <regex>

@@ -4,7 +4,7 @@
 #include "tests/system/media/MediaSupport.h"
 #include "tests/tools/zep/Envelope.h"
 #include "tests/tools/zep/Zep.h"
-#include "tools/zep/TMountedMedium.h"
+#include "tools/zep/media/TMountedMedium.h"
 
 #include <dlfcn.h>
 #include <gmock/gmock.h>

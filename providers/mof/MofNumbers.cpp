@@ -1,0 +1,110 @@
+#include "providers/mof/MofNumbers.h"
+
+#include <charconv>
+#include <cmath>
+#include <cstdint>
+#include <limits>
+#include <type_traits>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+using TType = TCIMValue::TCIMType;
+
+struct TInteger {
+  bool fIsNegative;
+  std::uint64_t fMagnitude;
+};
+
+[[noreturn]] void RefuseRange(TMofPlace const& place, TType type) {
+  throw TMofError(place, "the number is out of the range of " + type.ToString());
+}
+
+bool TakeSign(std::string_view& digits) {
+  const bool isNegative = digits.front() == '-';
+  if (isNegative || digits.front() == '+') digits.remove_prefix(1);
+  return isNegative;
+}
+
+// Takes off what tells the base.
+int TakeBase(std::string_view& digits) {
+  const char last = digits.empty() ? '0' : digits.back();
+  const bool isHexadecimal = digits.size() > 2 && digits[0] == '0' && (digits[1] == 'x' || digits[1] == 'X');
+  if (isHexadecimal) return digits.remove_prefix(2), 16;
+  if (last == 'b' || last == 'B') return digits.remove_suffix(1), 2;
+  return digits.size() > 1 && digits[0] == '0' ? 8 : 10;
+}
+
+TInteger ReadInteger(std::string_view digits, TType type, TMofPlace const& place) {
+  TInteger integer{TakeSign(digits), 0};
+  const int base = TakeBase(digits);
+  const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), integer.fMagnitude, base);
+  if (error == std::errc::result_out_of_range) RefuseRange(place, type);
+  if (error != std::errc() || end != digits.data() + digits.size()) throw TMofError(place, "expected an integer");
+  return integer;
+}
+
+template <class T>
+TCIMValue IntegerValue(std::string_view text, TType type, TMofPlace const& place) {
+  const TInteger integer = ReadInteger(text, type, place);
+  const std::uint64_t most = static_cast<std::uint64_t>(std::numeric_limits<T>::max());
+  const std::uint64_t least = std::is_signed_v<T> ? most + 1 : 0;  // of the negative ones, without the sign
+  if (integer.fMagnitude > (integer.fIsNegative ? least : most)) RefuseRange(place, type);
+  return TCIMValue(static_cast<T>(integer.fIsNegative ? 0 - integer.fMagnitude : integer.fMagnitude));
+}
+
+template <class T>
+TCIMValue RealValue(std::string_view digits, TType type, TMofPlace const& place) {
+  const bool isNegative = TakeSign(digits);
+  T number = 0;
+  const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), number);
+  if (error == std::errc::result_out_of_range) RefuseRange(place, type);
+  if (error != std::errc() || end != digits.data() + digits.size()) throw TMofError(place, "expected a number");
+  return TCIMValue(isNegative ? -number : number);
+}
+
+template <class T>
+std::string RealText(T number) {
+  if (!std::isfinite(number)) throw TZEPException(kZEPStatusNotSupported);
+  char text[64];
+  std::string digits(text, std::to_chars(text, text + sizeof text, number).ptr);
+  if (digits.find('.') == digits.npos) digits.insert(std::min(digits.find('e'), digits.size()), ".0");
+  return digits;
+}
+
+}  // namespace
+
+TCIMValue ReadMofNumber(std::string_view text, TType type, TMofPlace const& place) {
+  switch (type) {
+    case TType::kCIMTypeUint8:
+      return IntegerValue<unsigned char>(text, type, place);
+    case TType::kCIMTypeSint8:
+      return IntegerValue<signed char>(text, type, place);
+    case TType::kCIMTypeUint16:
+      return IntegerValue<unsigned short>(text, type, place);
+    case TType::kCIMTypeSint16:
+      return IntegerValue<short>(text, type, place);
+    case TType::kCIMTypeUint32:
+      return IntegerValue<unsigned int>(text, type, place);
+    case TType::kCIMTypeSint32:
+      return IntegerValue<int>(text, type, place);
+    case TType::kCIMTypeUint64:
+      return IntegerValue<unsigned long>(text, type, place);
+    case TType::kCIMTypeSint64:
+      return IntegerValue<long>(text, type, place);
+    case TType::kCIMTypeReal32:
+      return RealValue<float>(text, type, place);
+    case TType::kCIMTypeReal64:
+      return RealValue<double>(text, type, place);
+    case TType::kCIMTypeChar16:
+      return TCIMValue(TCIMChar16(IntegerValue<unsigned short>(text, TType::kCIMTypeUint16, place).operator unsigned short()));
+    default:
+      throw TMofError(place, "expected a value of the type " + type.ToString());
+  }
+}
+
+std::string MofRealText(float number) { return RealText(number); }
+std::string MofRealText(double number) { return RealText(number); }
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,105 @@
+// Object paths in the form of DSP0004.
+
+#include "providers/mof/MofValues.h"
+
+#include "ICIMClass.h"
+#include "ICIMPropertyDecl.h"
+#include "providers/memory/CIMNames.h"
+#include "providers/mof/MofNumbers.h"
+#include "providers/mof/MofStrings.h"
+#include "providers/mof/TMofLexer.h"
+
+#include <utility>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+const TCIMContext kNone;
+
+// The keys of a path, one after another.
+class TKeyReader {
+public:
+  TKeyReader(std::string keys, boost::shared_ptr<ICIMNamespace> ns)
+      : fKeys{"object path", std::move(keys)}, fLexer(fKeys), fNamespace(ns) {}
+
+  void ReadInto(TCIMReference& path) {
+    for (bool isMore = true; isMore; isMore = TakeComma()) {
+      const TMofToken name = Take(TMofToken::kName);
+      if (Take(TMofToken::kMark).fText != "=") Refuse(name);
+      const std::string key(name.fText);
+      const auto type = path.GetClass()->GetPropertyDecl(key, kNone)->GetType(kNone);
+      path.AddKeyValue(key, ReadMofValue(TakeValue(type), type, 0, fNamespace));
+    }
+  }
+
+private:
+  TMofToken Take(TMofToken::EKind kind) {
+    const TMofToken token = fLexer.Next();
+    if (token.fKind != kind) Refuse(token);
+    return token;
+  }
+
+  bool TakeComma() {
+    const TMofToken token = fLexer.Next();
+    if (token.fKind != TMofToken::kEnd && token.fText != ",") Refuse(token);
+    return token.fKind != TMofToken::kEnd;
+  }
+
+  TMofValue TakeValue(TCIMValue::TCIMType type) {
+    const TMofToken token = fLexer.Next();
+    TMofLiteral literal{TMofLiteral::kNull, {&fKeys, token.fText}, {}};
+    const bool isQuoted = token.fKind == TMofToken::kString;
+    if (isQuoted && type >= TCIMValue::TCIMType::kCIMTypeString) {
+      literal.fKind = TMofLiteral::kString;
+      AppendUnescaped(literal.fString, literal.fPlace);
+    } else if (token.fKind == TMofToken::kChar)
+      literal.fKind = TMofLiteral::kChar;
+    else {  // a word or a number, which may stand in quotes
+      if (isQuoted) literal.fPlace.fText = token.fText.substr(1, token.fText.size() - 2);
+      const std::string_view word = literal.fPlace.fText;
+      literal.fKind = IsSameName(word, "true") || IsSameName(word, "false") ? TMofLiteral::kBoolean : TMofLiteral::kNumber;
+      if (word.empty()) Refuse(token);
+    }
+    return {literal.fPlace, false, {literal}};
+  }
+
+  [[noreturn]] void Refuse(TMofToken const& token) const { throw TMofError({&fKeys, token.fText}, "this is no key of a path"); }
+
+  TMofFile const fKeys;
+  TMofLexer fLexer;
+  boost::shared_ptr<ICIMNamespace> fNamespace;
+};
+
+TCIMValue Read(std::string const& text, boost::shared_ptr<ICIMNamespace> ns) {
+  const std::size_t start = text.rfind(':', text.find('=')) + 1;  // 0 when there is none
+  const std::size_t dot = text.find('.', start);
+  TCIMReference path(ns, kNone);
+  path.SetClassName(text.substr(start, dot == text.npos ? dot : dot - start));
+  if (dot != text.npos) TKeyReader(text.substr(dot + 1), ns).ReadInto(path);
+  return TCIMValue(path);
+}
+
+}  // namespace
+
+TCIMValue ReadMofPath(std::string const& path, TMofPlace const& place, boost::shared_ptr<ICIMNamespace> ns) {
+  try {
+    return Read(path, ns);
+  } catch (TZEPException const&) {
+    throw TMofError(place, "expected the path of an object whose class is declared, such as \"X_Disk.Id=5\"",
+                    kZEPStatusInvalidReference);
+  }
+}
+
+std::string MofPathText(TCIMReference const& path) {
+  if (!path.GetClass()) ThrowUnprintable();
+  std::string text = path.GetClassName();
+  char before = '.';
+  path.EnumerateKeyBindings([&](std::pair<std::string, TCIMValue> const& key) {
+    text += std::exchange(before, ',') + key.first + "=" + MofScalarText(key.second);
+    return true;
+  });
+  return text;
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,115 @@
+#include "providers/mof/TMofSources.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <system_error>
+
+namespace NQRVZEP20 {
+
+namespace fs = std::filesystem;
+
+namespace {
+
+constexpr std::size_t kMostOpenFiles = 100;
+
+std::string ReasonOf(int error) { return std::generic_category().message(error); }
+
+EZEPStatusCode StatusOf(int error) {
+  if (error == ENOENT) return kZEPStatusFileNotFound;
+  return error == EACCES ? kZEPStatusAccessDenied : kZEPStatusFileSystemError;
+}
+
+// The path without links and dots; empty, with the reason, when there is no such file, or it is no regular one.
+fs::path RegularFile(fs::path const& path, int& error) {
+  std::error_code failure;
+  const fs::path canonical = fs::canonical(path, failure);
+  const bool isRegular = !failure && fs::is_regular_file(canonical, failure);
+  error = failure ? failure.value() : isRegular ? 0 : fs::is_directory(canonical) ? EISDIR : EINVAL;
+  return error == 0 ? canonical : fs::path();
+}
+
+// An open file, closed when it goes out of scope.
+class TOpenFile {
+public:
+  explicit TOpenFile(fs::path const& path) : fFd(::open(path.c_str(), O_RDONLY | O_CLOEXEC)) {}
+  TOpenFile(TOpenFile const&) = delete;
+  TOpenFile& operator=(TOpenFile const&) = delete;
+  ~TOpenFile() {
+    if (fFd >= 0) ::close(fFd);
+  }
+  int Get() const { return fFd; }
+
+private:
+  int const fFd;
+};
+
+// Reads up to the end of the file, whatever its size is said to be: one that changes meanwhile, or tells no size, is neither
+// cut nor padded. Returns 0, or the error of the system that ended the reading; `text` is of no use then.
+int ReadWhole(fs::path const& path, std::string& text) {
+  constexpr std::size_t kLeast = 4096;
+  TOpenFile const file(path);
+  if (file.Get() < 0) return errno;
+  struct stat status = {};
+  if (::fstat(file.Get(), &status) != 0) return errno;
+
+  // One byte more than its size, so that the end is seen without growing.
+  text.resize(std::max(static_cast<std::size_t>(status.st_size) + 1, kLeast));
+  std::size_t size = 0;
+  for (;;) {
+    const ssize_t got = ::read(file.Get(), text.data() + size, text.size() - size);
+    if (got < 0) return errno;
+    if (got == 0) break;
+    size += static_cast<std::size_t>(got);
+    if (size == text.size()) text.resize(2 * size);
+  }
+  text.resize(size);
+  return 0;
+}
+
+bool IsWithin(fs::path const& folder, fs::path const& path) {
+  return std::mismatch(folder.begin(), folder.end(), path.begin(), path.end()).first == folder.end();
+}
+
+}  // namespace
+
+TMofFile const& TMofSources::OpenFirst(std::string const& path) {
+  int error = 0;
+  const fs::path canonical = RegularFile(path, error);
+  std::string text;
+  if (error == 0) error = ReadWhole(canonical, text);
+  if (error != 0) throw TMofError(path + ": cannot be read: " + ReasonOf(error), StatusOf(error));
+  fFolder = canonical.parent_path();
+  fOpen.push_back({canonical, path});
+  return Add(path, std::move(text));
+}
+
+TMofFile const& TMofSources::OpenText(std::string const& text, std::string const& name) { return Add(name, text); }
+
+TMofFile const& TMofSources::OpenIncluded(std::string const& name, TMofPlace const& directive) {
+  if (fFolder.empty()) throw TMofError(directive, "a text that is no file cannot include one");
+  if (fOpen.size() >= kMostOpenFiles) throw TMofError(directive, "files include one another more than 100 deep");
+
+  int error = 0;
+  const fs::path canonical = RegularFile(fOpen.back().fPath.parent_path() / name, error);
+  if (error == 0 && !IsWithin(fFolder, canonical))
+    throw TMofError(directive, "the included file lies outside the folder of the first one", kZEPStatusAccessDenied);
+  const auto isIt = [&canonical](TOpen const& open) { return open.fPath == canonical; };
+  if (error == 0 && std::any_of(fOpen.begin(), fOpen.end(), isIt)) throw TMofError(directive, "the file includes itself");
+
+  std::string text;
+  if (error == 0) error = ReadWhole(canonical, text);
+  if (error != 0) throw TMofError(directive, "the included file cannot be read: " + ReasonOf(error), StatusOf(error));
+  fOpen.push_back({canonical, fOpen.back().fName.parent_path() / name});
+  return Add(fOpen.back().fName.string(), std::move(text));
+}
+
+TMofFile const& TMofSources::Add(std::string const& name, std::string text) {
+  fDocument.fFiles.push_back(std::make_unique<TMofFile>(TMofFile{name, std::move(text)}));
+  return *fDocument.fFiles.back();
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,148 @@
+// Large texts of MOF: that time and memory grow with them and no faster, however deep their classes inherit.
+
+#include "Mof.h"
+#include "tests/providers/memory/Collect.h"
+
+#include <malloc.h>
+#include <sys/resource.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <ctime>
+
+namespace NQRVZEP20 {
+namespace {
+
+constexpr char kQualifiers[] =
+    "Qualifier Key : boolean = false, Scope(property, reference), Flavor(DisableOverride, ToSubclass);\n"
+    "Qualifier Association : boolean = false, Scope(association);\n"
+    "Qualifier Description : string = null, Scope(any), Flavor(Translatable);\n";
+
+std::string Name(int number) { return "X_C" + std::to_string(number); }
+
+// A chain of so many classes, each with a property; an association if wanted, and an instance of the last.
+std::string Chain(int depth, bool isAssociation, bool hasInstance) {
+  std::string text = kQualifiers;
+  for (int at = 0; at < depth; ++at) {
+    const std::string number = std::to_string(at);
+    if (at == 0 && isAssociation) text += "[Association]\n";
+    text += "class " + Name(at) + (at == 0 ? "" : " : " + Name(at - 1)) + " {\n";
+    text += at == 0 ? "  [Key] uint32 Id;\n};\n" : "  [Description(\"" + number + "\")] uint32 P" + number + ";\n};\n";
+  }
+  if (hasInstance) text += "instance of " + Name(depth - 1) + " { Id = 7; P1 = 8; };\n";
+  return text;
+}
+
+TEST(DeepInheritanceTest, AClassAHundredThousandDeepHasWhatItInherits) {
+  constexpr int kDepth = 100000;
+  const auto ns = NewNamespace();
+  ReadMofText(Chain(kDepth, true, true), "deep.mof", ns);
+  const auto last = ns->GetClass(Name(kDepth - 1), kNone);
+  EXPECT_TRUE(last->GetClassFlag(kNone));
+  EXPECT_EQ(SubClassNames(*ns->GetClass(Name(0), kNone)).size(), kDepth - 1u);
+  const auto instances = All(*last, &ICIMClass::EnumerateInstances);
+  ASSERT_EQ(instances.size(), 1u);
+  EXPECT_EQ(instances[0]->GetPath(kNone).GetPath(), Name(kDepth - 1) + ".Id=\"7\"");
+  EXPECT_EQ(instances[0]->GetProperty("P1", kNone)->GetValue(kNone).ToString(), "8");
+  EXPECT_EQ(All(*instances[0], &ICIMInstance::EnumerateProperties).size(), std::size_t(kDepth));
+  EXPECT_TRUE(last->GetPropertyDecl("Id", kNone)->IsKey(kNone));
+}
+
+// The processor time of the quickest of three runs.
+template <class TAction>
+double SecondsOf(TAction const& action) {
+  double best = 1e9;
+  for (int run = 0; run < 3; ++run) {
+    const std::clock_t start = std::clock();
+    action();
+    best = std::min(best, static_cast<double>(std::clock() - start) / CLOCKS_PER_SEC);
+  }
+  return best;
+}
+
+TEST(DeepInheritanceTest, TenTimesTheDepthDoesNotCostThirtyTimesAsMuch) {
+  for (const bool hasInstance : {false, true}) {
+    SCOPED_TRACE(hasInstance);
+    const std::string small = Chain(1000, false, hasInstance), large = Chain(10000, false, hasInstance);
+    const auto read = [](std::string const& text) {
+      const auto ns = NewNamespace();
+      ReadMofText(text, "deep.mof", ns);
+      for (auto const& root : All(*ns, &ICIMNamespace::EnumerateClasses))
+        root->EnumerateSubClasses([](boost::shared_ptr<ICIMClass> cls) { return !cls->GetClassFlag(kNone); }, kNone);
+    };
+    const double ofSmall = SecondsOf([&] { read(small); });
+    EXPECT_LT(SecondsOf([&] { read(large); }), 30 * ofSmall);
+  }
+}
+
+TEST(DeepInheritanceTest, InstancesMadeFromTheBottomUpwardsAllHaveTheKeysOfTheTop) {
+  const auto ns = NewNamespace();
+  ReadMofText(Chain(50, false, false), "deep.mof", ns);
+  for (int at = 49; at >= 0; --at) {
+    const auto cls = ns->GetClass(Name(at), kNone);
+    const auto instance = cls->CreateInstance(kNone);
+    instance->GetProperty("Id", kNone)->SetValue(TCIMValue(static_cast<unsigned int>(at)), kNone);
+    cls->CommitInstance(instance, kNone);
+    EXPECT_EQ(instance->GetPath(kNone).GetPath(), Name(at) + ".Id=\"" + std::to_string(at) + "\"");
+    EXPECT_EQ(All(*instance, &ICIMInstance::EnumerateProperties).size(), at + 1u);
+    EXPECT_STATUS(cls->AddPropertyDecl("More", TCIMValue(1u), kNone), kZEPStatusInvalidOpSequence);
+  }
+}
+
+TEST(DeepInheritanceTest, AClassIsAnAssociationHoweverLateItsSuperclassIsMarked) {
+  const auto ns = NewNamespace();
+  ReadMofText(Chain(20, false, false), "deep.mof", ns);
+  const auto mark = [&](int at, bool value) {
+    ns->GetClass(Name(at), kNone)->AddQualifier(ns->GetQualifierDecl("Association", kNone), TCIMValue(value), 0, kNone);
+  };
+  const auto isAssociation = [&](int at) { return ns->GetClass(Name(at), kNone)->GetClassFlag(kNone); };
+  mark(5, false);
+  EXPECT_FALSE(isAssociation(19));
+  mark(10, true);
+  EXPECT_FALSE(isAssociation(9));
+  EXPECT_TRUE(isAssociation(10));
+  mark(2, true);
+  EXPECT_FALSE(isAssociation(1));
+  for (const int at : {2, 5, 9, 19}) EXPECT_TRUE(isAssociation(at)) << at;
+  EXPECT_TRUE(ns->CreateClass(ns->GetClass(Name(19), kNone), "X_New", kNone)->GetClassFlag(kNone));
+}
+
+// The greatest memory of a process that reads the file, in bytes.
+double PeakOfReading(std::string const& path) {
+  ::malloc_trim(0);  // what the tests before left would be used first
+  const pid_t child = ::fork();
+  if (child == 0) {
+    ReadMofFile(path, NewNamespace());
+    ::_exit(0);
+  }
+  int status = 0;
+  rusage usage = {};
+  EXPECT_EQ(::wait4(child, &status, 0, &usage), child);
+  EXPECT_EQ(status, 0);
+  return usage.ru_maxrss * 1024.0;
+}
+
+TEST(DeepInheritanceTest, ASchemaTakesSevenAndAHalfBytesOfMemoryForEachOfItsOwnAtTheMost) {
+  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which takes memory of its own";
+  std::string text = kQualifiers;
+  for (int at = 0; at < 5000; ++at) {
+    const std::string number = std::to_string(at);
+    text += "[Description(\"Class number " + number + " of the generated schema, which describes a part of a machine.\")]\n" +
+            "class " + Name(at) + (at == 0 ? "" : " : " + Name((at - 1) / 3)) + " {\n";
+    for (int p = 0; p < 8; ++p)
+      text += "  [Description(\"Property " + std::to_string(p) + " of class " + number +
+              ", which says something about the part that nobody else says.\")]\n  string P" + number + "_" + std::to_string(p) +
+              ";\n";
+    text += "  [Description(\"Starts the part, after a delay in seconds.\")]\n  uint32 Start(uint32 Delay, string Name);\n};\n";
+  }
+  TTempDir const dir;
+  WriteFile(dir.Path("empty.mof"), "");
+  WriteFile(dir.Path("schema.mof"), text);
+  const double taken = PeakOfReading(dir.Path("schema.mof")) - PeakOfReading(dir.Path("empty.mof"));
+  EXPECT_LT(taken / static_cast<double>(text.size()), 7.5);
+  EXPECT_GT(taken, 0.5 * static_cast<double>(text.size()));  // it was measured at all
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

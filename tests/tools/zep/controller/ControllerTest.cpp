@@ -1,0 +1,431 @@
+// zep remote without a controller: how it is called, where the password comes from, what it prints.
+
+#include "tests/tools/zep/Envelope.h"
+#include "tests/tools/zep/Zep.h"
+#include "tools/zep/controller/Controller.h"
+
+#include <gmock/gmock.h>
+#include <poll.h>
+#include <pty.h>
+#include <sys/prctl.h>
+#include <sys/ptrace.h>
+#include <sys/stat.h>
+
+#include <string>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+using testing::HasSubstr;
+using testing::Not;
+
+std::string const kSaid = "1234\0AB7\0KQ12345\0\0"s;
+
+std::string WithoutHead(TJson document) {
+  for (char const* member : {"document", "version", "zep", "sample", "exitStatus", "reason"}) document.erase(member);
+  return document.dump();
+}
+
+TEST(RemoteIdentityTextTest, PutsTogetherWhatTheProcessSaid) {
+  TRemoteIdentity const whole = IdentityFrom("h", kSaid, true);
+  EXPECT_TRUE(IsComplete(whole));
+  EXPECT_FALSE(IsNothing(whole));
+  ExpectEnvelope(AsJson(whole).dump(), 0, "zep remote");
+  EXPECT_EQ(WithoutHead(AsJson(whole)), R"({"host":"h","type":"1234","model":"AB7","serialNumber":"KQ12345"})");
+  EXPECT_EQ(AsText(whole), "Remote server    h\nMachine type     1234\nModel            AB7\nSerial number    KQ12345\n");
+
+  TRemoteIdentity const part = IdentityFrom("h", "1234\0\0\0why\0"s, true);
+  EXPECT_FALSE(IsComplete(part));
+  EXPECT_FALSE(IsNothing(part));
+  ExpectEnvelope(AsJson(part).dump(), 2, "zep remote");
+  EXPECT_EQ(AsJson(part)["reason"], "why");
+  EXPECT_EQ(WithoutHead(AsJson(part)), R"({"host":"h","type":"1234","model":null,"serialNumber":null,"error":"why"})");
+  EXPECT_EQ(AsText(part), "Remote server    h\nMachine type     1234\nModel            unknown\nSerial number    unknown\n");
+}
+
+TEST(RemoteIdentityTextTest, AProcessThatDidNotEndToldNothing) {
+  for (std::string const& said : {""s, "12"s, kSaid}) {
+    TRemoteIdentity const identity = IdentityFrom("h", said, false);
+    EXPECT_TRUE(IsNothing(identity));
+    EXPECT_EQ(identity.fError, "the process that asked its controller did not come to its end");
+  }
+}
+
+TEST(RemoteIdentityTextTest, WhatAControllerSaysIsMadePrintable) {
+  TRemoteIdentity const identity = IdentityFrom("h", "12\x1B[2J\0A\xFF\0K\0\0"s, true);
+  EXPECT_THAT(AsText(identity), HasSubstr("12\\x1b[2J"));
+  EXPECT_THAT(AsText(identity), HasSubstr("A\\xff"));
+}
+
+class ZepRemoteTest : public testing::Test {
+protected:
+  TRun Run(std::vector<std::string> arguments, std::map<std::string, std::string> const& environment = {}) {
+    arguments.insert(arguments.begin(), "remote");
+    TCall call = {arguments};
+    call.environment = environment;
+    call.hasNoTerminal = true;
+    return zep_.Run(call);
+  }
+
+  std::string File(std::string const& name, std::string const& text) {
+    WriteFile(zep_.Path(name), text);
+    return zep_.Path(name);
+  }
+
+  static std::string Private(std::string const& file) {
+    fs::permissions(file, fs::perms::owner_read | fs::perms::owner_write);
+    return file;
+  }
+
+  TInstallation zep_;
+  std::map<std::string, std::string> const password_ = {{"ZEP_BMC_PASSWORD", "zeppass1"}};
+};
+
+std::string const kNothing =
+    "no session with its controller after N s: libipmiClient.so cannot be loaded (install the package libzepcore-ipmi), or has "
+    "no memory left";
+
+TEST_F(ZepRemoteTest, WithoutTheClientLibraryNothingIsTold) {
+  TRun const run = Run({"192.0.2.1", "--user", "zepadmin"}, password_);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output,
+            "Remote server    192.0.2.1\nMachine type     unknown\nModel            unknown\nSerial number    unknown\n");
+  EXPECT_EQ(run.errors, "zep: 192.0.2.1: " + kNothing + "\n");
+
+  TRun const json = Run({"192.0.2.1", "--user", "zepadmin", "--json"}, password_);
+  EXPECT_EQ(json.status, 1);
+  EXPECT_EQ(JsonOf(json)["document"], "zep remote");
+  EXPECT_EQ(JsonOf(json)["host"], "192.0.2.1");
+  EXPECT_TRUE(JsonOf(json)["type"].is_null());
+  EXPECT_EQ(JsonOf(json)["error"], kNothing);
+}
+
+TEST_F(ZepRemoteTest, AListPrintsOneLineForEachHost) {
+  std::string const hosts = File("hosts", "# the machine room\n\none\n  two \t\r\n::1\n#\none");
+  TRun const run = Run({"--hosts", hosts, "--user", "zepadmin", "--parallel", "1"}, password_);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors, "zep: 4 of 4 hosts done, 4 failed\n");
+  std::vector<std::string> names;
+  for (std::string const& line : LinesOf(run.output)) names.push_back(nlohmann::json::parse(line)["host"]);
+  EXPECT_THAT(names, testing::ElementsAre("one", "two", "::1", "one"));
+}
+
+TEST_F(ZepRemoteTest, WrongUsageIsToldApart) {
+  std::string const hosts = File("hosts", "one\n");
+  std::vector<std::vector<std::string>> const calls = {
+      {"--user", "u"},  // no host
+      {"host", "--hosts", hosts, "--user", "u"},
+      {"host"},  // no user
+      {"host", "--user", "u", "--password", "p"},
+      {"--hosts", hosts, "--user", "u", "--parallel", "0"},
+      {"--hosts", hosts, "--user", "u", "--parallel", "1001"},
+      {"--hosts", hosts, "--user", "u", "--timeout", "0"},
+      {"host", "--user", "u", "--timeout", "x"},
+      {"one", "two", "--user", "u"},
+  };
+  for (auto const& call : calls) {
+    SCOPED_TRACE(testing::PrintToString(call));
+    TRun const run = Run(call, password_);
+    EXPECT_EQ(run.status, 64);
+    EXPECT_EQ(run.output, "");
+    EXPECT_NE(run.errors, "");
+  }
+}
+
+TEST_F(ZepRemoteTest, AFileOfHostsThatCannotServeIsTold) {
+  std::string const absent = zep_.Path("absent"), empty = File("empty", "\n# nothing\n \n");
+  TRun const without = Run({"--hosts", absent, "--user", "u"}, password_);
+  EXPECT_EQ(without.status, 1);
+  EXPECT_EQ(without.errors, "zep: " + absent + " cannot be read: No such file or directory\n");
+  EXPECT_EQ(Run({"--hosts", empty, "--user", "u"}, password_).errors, "zep: " + empty + " names no host\n");
+}
+
+TEST_F(ZepRemoteTest, AFileOfHostsThatFailsWhileItIsReadIsNotTakenForItsEnd) {
+  struct TRow {
+    std::string path, reason;
+  };
+  for (TRow const& row : {TRow{zep_.Path("lib"), "Is a directory"}, TRow{"/proc/self/mem", "Input/output error"}}) {
+    TRun const run = Run({"--hosts", row.path, "--user", "u"}, password_);
+    EXPECT_EQ(run.status, 1);
+    EXPECT_EQ(run.output, "");
+    EXPECT_EQ(run.errors, "zep: " + row.path + " cannot be read: " + row.reason + "\n");
+  }
+}
+
+TEST_F(ZepRemoteTest, WithoutATerminalThePasswordMustComeFromElsewhere) {
+  TRun const run = Run({"host", "--user", "u"});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.errors, "zep: there is no terminal to ask for the password: set ZEP_BMC_PASSWORD or use --password-file\n");
+  std::string const absent = zep_.Path("absent");
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", absent}, password_).errors,
+            "zep: the file of --password-file cannot be read: No such file or directory\n");
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", zep_.Path("lib")}, password_).errors,
+            "zep: " + zep_.Path("lib") + " cannot be read: Is a directory\n");
+  std::string const empty = File("empty", "");
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", empty}, password_).errors,
+            "zep: there is no password in " + empty + "\n");
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", Private(File("password", "zeppass1\n"))}).errors,
+            "zep: host: " + kNothing + "\n");
+  EXPECT_EQ(Run({"host", "--user", "u"}, {{"ZEP_BMC_PASSWORD", ""}}).errors, "zep: host: " + kNothing + "\n")
+      << "an empty one is one";
+}
+
+TEST_F(ZepRemoteTest, ADebugLogHoldsNoPassword) {
+  std::string const log = zep_.Path("log");
+  TRun const run = Run({"host", "--user", "u", "--debug-log", log}, password_);
+  EXPECT_EQ(run.errors, "zep: host: " + kNothing + "\n") << "so it is not warned of";
+  EXPECT_THAT(ReadFile(log), HasSubstr("FDR_[Debug] "));
+  EXPECT_EQ((run.errors + run.output + ReadFile(log)).find("zeppass1"), std::string::npos);
+}
+
+TEST_F(ZepRemoteTest, ADebugLogIsForItsOwnerOnly) {
+  std::string const log = File("log", "from before");
+  fs::permissions(log, static_cast<fs::perms>(0644));
+  Run({"host", "--user", "u", "--debug-log", log}, password_);
+  EXPECT_EQ(fs::status(log).permissions(), static_cast<fs::perms>(0600));
+  EXPECT_EQ(ReadFile(log).find("from before"), std::string::npos);
+  Run({"host", "--user", "u", "--debug-log", log + "2"}, password_);
+  EXPECT_EQ(fs::status(log + "2").permissions(), static_cast<fs::perms>(0600));
+}
+
+TEST_F(ZepRemoteTest, ADebugLogIsARegularFileOfTheCaller) {
+  std::string const victim = File("victim", "untouched"), link = zep_.Path("link"), fifo = zep_.Path("fifo");
+  fs::create_symlink(victim, link);
+  fs::create_hard_link(victim, zep_.Path("second"));
+  ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
+  struct TRow {
+    std::string log, reason;
+  };
+  for (TRow const& row : {TRow{link, "it is a symbolic link"}, TRow{zep_.Path("second"), "it has a second name (a hard link)"},
+                          TRow{fifo, "it is not a regular file"}, TRow{"/dev/null", "it is not a regular file"}}) {
+    TRun const run = Run({"host", "--user", "u", "--debug-log", row.log}, password_);
+    EXPECT_EQ(run.status, 1);
+    EXPECT_EQ(run.errors, "zep: the debug log " + row.log + " cannot be written: " + row.reason + "\n");
+  }
+  EXPECT_EQ(ReadFile(victim), "untouched");
+}
+
+TEST_F(ZepRemoteTest, AFileOfAnotherUserIsNoDebugLog) {
+  NEEDS(::geteuid() == 0, "root, who may write another user's file");
+  std::string const log = File("log", "untouched");
+  ASSERT_EQ(::chown(log.c_str(), 65534, 65534), 0);
+  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", log}, password_).errors,
+            "zep: the debug log " + log + " cannot be written: it belongs to another user\n");
+  EXPECT_EQ(ReadFile(log), "untouched");
+}
+
+TEST_F(ZepRemoteTest, APasswordFileThatEveryUserMayReadIsWarnedOf) {
+  std::string const file = File("password", "zeppass1\n");
+  fs::permissions(file, static_cast<fs::perms>(0644));
+  TRun const run = Run({"host", "--user", "u", "--password-file", file});
+  EXPECT_EQ(run.errors, "zep: warning: every user may read the passwords in " + file +
+                            " (mode 0644); chmod 600 makes it private\nzep: host: " + kNothing + "\n");
+  fs::permissions(file, static_cast<fs::perms>(0640));
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", file}).errors, "zep: host: " + kNothing + "\n");
+}
+
+TEST_F(ZepRemoteTest, AHostWithAPasswordIsNotAsked) {
+  TRun const run = Run({"admin:topsecret@host", "--user", "u", "--json"}, password_);
+  EXPECT_EQ(run.status, 64);
+  EXPECT_THAT(run.errors, HasSubstr("zep: the host is not a host name or an address; "));
+  TRun const list = Run({"--hosts", File("hosts", "admin:topsecret@host\n"), "--user", "u"}, password_);
+  EXPECT_EQ(list.status, 1);
+  EXPECT_THAT(list.output, HasSubstr("line 1 of "));
+  EXPECT_THAT(list.output, HasSubstr("not a host name or an address; "));
+  EXPECT_THAT(list.output + list.errors, Not(HasSubstr("topsecret")));
+}
+
+// ---- The password of a process that runs ----
+
+// Calls of zep that go on for a while, as a user without privileges.
+class ZepSecretProcessTest : public ZepRemoteTest {
+protected:
+  void SetUp() override {
+    NEEDS(::geteuid() == 0, "root, who looks at another user's process");
+    zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+  }
+  void TearDown() override {
+    if (zepProcess_ <= 0) return;
+    ::kill(zepProcess_, SIGKILL);
+    ::waitpid(zepProcess_, nullptr, 0);
+  }
+
+  // zep as nobody, with a controller that does not answer; returns once the process that asks it is there.
+  void Start() {
+    zepProcess_ = ::fork();
+    if (zepProcess_ == 0) {
+      ::prctl(PR_SET_PDEATHSIG, SIGKILL);
+      ::setenv("ZEP_BMC_PASSWORD", "zeppass1", 1);
+      ::setenv("FAKE_IPMI_CODE", "wait", 1);
+      std::string const program = zep_.Path("bin/zep");
+      if (::setgroups(0, nullptr) != 0 || ::setgid(65534) != 0 || ::setuid(65534) != 0) ::_exit(126);
+      ::execl(program.c_str(), "zep", "remote", "host", "--user", "u", nullptr);
+      ::_exit(127);
+    }
+    for (int tries = 0; tries < 2000 && child_.empty(); ++tries, ::usleep(5000)) {
+      std::ifstream children("/proc/" + std::to_string(zepProcess_) + "/task/" + std::to_string(zepProcess_) + "/children");
+      children >> child_;
+    }
+    ASSERT_FALSE(child_.empty());
+  }
+
+  static unsigned OwnerOf(std::string const& process) {
+    struct stat status {};
+    return ::stat(("/proc/" + process + "/environ").c_str(), &status) == 0 ? status.st_uid : ~0u;
+  }
+
+  // errno of an attempt of the same user to trace the process; 0 when it succeeds.
+  static int TraceOf(std::string const& process) {
+    pid_t const tracer = ::fork();
+    if (tracer == 0) {
+      if (::setgroups(0, nullptr) != 0 || ::setgid(65534) != 0 || ::setuid(65534) != 0) ::_exit(126);
+      ::_exit(::ptrace(PTRACE_SEIZE, std::stoi(process), nullptr, nullptr) == 0 ? 0 : errno);
+    }
+    int status = 0;
+    ::waitpid(tracer, &status, 0);
+    return WEXITSTATUS(status);
+  }
+
+  pid_t zepProcess_ = 0;
+  std::string child_;  // the process that asks the controller
+};
+
+TEST_F(ZepSecretProcessTest, TheEnvironmentShowsNoPassword) {
+  Start();
+  for (std::string const& process : {std::to_string(zepProcess_), child_}) {
+    std::string const environment = ReadFile("/proc/" + process + "/environ");
+    EXPECT_THAT(environment, HasSubstr("FAKE_IPMI_CODE=wait"));
+    EXPECT_EQ(environment.find("zeppass1"), std::string::npos);
+  }
+}
+
+TEST_F(ZepSecretProcessTest, NoProcessOfTheSameUserLooksIntoIt) {
+  Start();
+  for (std::string const& process : {std::to_string(zepProcess_), child_}) {
+    EXPECT_EQ(OwnerOf(process), 0u) << "so it is dumped nowhere";
+    EXPECT_EQ(TraceOf(process), EPERM);
+  }
+}
+
+TEST_F(ZepRemoteTest, ADebugLogThatCannotBeWrittenIsTold) {
+  std::string const nowhere = zep_.Path("none/log");
+  TRun const run = Run({"host", "--user", "u", "--debug-log", nowhere}, password_);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.output, "");
+  EXPECT_EQ(run.errors, "zep: the debug log " + nowhere + " cannot be written: No such file or directory\n");
+  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", zep_.Path("lib")}, password_).errors,
+            "zep: the debug log " + zep_.Path("lib") + " cannot be written: Is a directory\n");
+}
+
+TEST_F(ZepRemoteTest, WhyThereIsNoSessionIsToldInWords) {
+  zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+  struct TRow {
+    char const *code, *words;
+  } const rows[] = {
+      {"1", "it refuses the password"},
+      {"2", "it knows no such user, or the account is disabled"},
+      {"3", "it gives no answer"},
+      {"4", "the host name has no address"},
+      {"5", "nothing can be sent there"},
+      {"6", "it has no session left"},
+      {"7", "the account may not be administrator, or there is no cipher suite in common"},
+      {"8", "the user name or the password cannot be used; it may be too long"},
+      {"9", "code 9 of libipmiClient.so"},
+      {"10", "it did not carry a command out"},
+      {"11", "libipmiClient.so cannot be loaded (install the package libzepcore-ipmi), or has no memory left"},
+      {"12", "its answers make no sense"},
+      {"-7", "code -7 of libipmiClient.so"},
+      {"4711", "code 4711 of libipmiClient.so"},
+  };
+  std::string const log = zep_.Path("log");
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.code);
+    auto environment = password_;
+    environment["FAKE_IPMI_CODE"] = row.code;
+    TRun const run = Run({"host", "--user", "u"}, environment);
+    EXPECT_EQ(run.status, 1);
+    EXPECT_EQ(run.errors, "zep: host: no session with its controller after N s: "s + row.words + "\n");
+    TRun const logged = Run({"host", "--user", "u", "--debug-log", log}, environment);
+    EXPECT_THAT(logged.errors, testing::EndsWith(run.errors));
+    EXPECT_EQ((logged.output + logged.errors + ReadFile(log)).find("zeppass1"), std::string::npos);
+  }
+}
+
+// The code is read from a log that has what the caller gave before it.
+TEST_F(ZepRemoteTest, NoUserOrPasswordPassesForACode) {
+  zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+  std::string const forged = "x\nFDR_[Debug] 1/1/2026  0:0:0 Connection Error code:3\n";
+  TRun const run = Run({"host", "--user", forged}, {{"ZEP_BMC_PASSWORD", forged}, {"FAKE_IPMI_CODE", "1"}});
+  EXPECT_THAT(run.errors, testing::EndsWith(": it refuses the password\n"));
+}
+
+TEST_F(ZepRemoteTest, AClientLibraryWithoutItsFunctionIsTold) {
+  zep_.Add("libipmiClient.so", TEST_LIB_DIR "/libsmbios.so");
+  EXPECT_EQ(Run({"host", "--user", "u"}, password_).errors,
+            "zep: host: no session with its controller after N s: libipmiClient.so lacks a function\n");
+}
+
+TEST_F(ZepRemoteTest, AnOpenedSessionThatTellsNothingIsTold) {
+  zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+  auto environment = password_;
+  environment["FAKE_IPMI_CODE"] = "0";
+  TRun const run = Run({"host", "--user", "u", "--json"}, environment);
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(JsonOf(run)["error"], "the controller did not tell everything");
+}
+
+// ---- At a terminal ----
+
+struct TSession {
+  int status;
+  std::string shown;
+};
+
+// Runs zep at a terminal of its own and types the text once something is asked.
+TSession TypeAt(TInstallation const& zep, std::string const& typed) {
+  std::string const program = zep.Path("bin/zep");
+  int terminal = -1;
+  pid_t const child = ::forkpty(&terminal, nullptr, nullptr, nullptr);
+  if (child == 0) {
+    ::unsetenv("ZEP_BMC_PASSWORD");
+    ::execl(program.c_str(), "zep", "remote", "host", "--user", "zepadmin", nullptr);
+    ::_exit(127);
+  }
+  TSession session{};
+  bool isTyped = false;
+  char chunk[512];
+  for (ssize_t got = 0; (got = ::read(terminal, chunk, sizeof chunk)) > 0;) {
+    session.shown.append(chunk, static_cast<std::size_t>(got));
+    if (isTyped || session.shown.find(": ") == std::string::npos) continue;
+    isTyped = ::write(terminal, typed.data(), typed.size()) == static_cast<ssize_t>(typed.size());
+  }
+  int status = 0;
+  ::waitpid(child, &status, 0);
+  session.shown = WithoutSeconds(session.shown);
+  session.status = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
+  ::close(terminal);
+  return session;
+}
+
+TEST_F(ZepRemoteTest, ThePasswordIsAskedForWithoutEcho) {
+  TSession const session = TypeAt(zep_, "zeppass1\n");
+  EXPECT_EQ(session.status, 1);
+  EXPECT_THAT(session.shown, testing::StartsWith("Password of zepadmin: \r\nRemote server"));
+  EXPECT_THAT(session.shown, HasSubstr("zep: host: " + kNothing));
+  EXPECT_EQ(session.shown.find("zeppass1"), std::string::npos);
+}
+
+TEST_F(ZepRemoteTest, AnInterruptInsteadOfThePasswordEndsIt) {
+  TSession const session = TypeAt(zep_, "zepp\x03");
+  EXPECT_EQ(session.status, 128 + SIGINT);
+  EXPECT_EQ(session.shown, "Password of zepadmin: \r\n");
+}
+
+TEST_F(ZepRemoteTest, WithoutAPasswordNothingIsAsked) {
+  TSession const session = TypeAt(zep_, "\x04");
+  EXPECT_EQ(session.status, 1);
+  EXPECT_EQ(session.shown, "Password of zepadmin: \r\nzep: no password was given\r\n");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

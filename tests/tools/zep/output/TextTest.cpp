@@ -1,0 +1,166 @@
+#include "tools/zep/output/Text.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+using testing::ElementsAre;
+
+TEST(TextTest, WhatATerminalWouldActUponIsEscaped) {
+  struct TRow {
+    std::string text, printable;
+  } const rows[] = {
+      {"plain text, 100 %", "plain text, 100 %"},
+      {"", ""},
+      {"\x1b[31mred", "\\x1b[31mred"},
+      {"a\nb\tc\rd", "a\\x0ab\\x09c\\x0dd"},
+      {std::string("a\0b", 3), "a\\x00b"},
+      {"\x7f", "\\x7f"},
+      {"caf\xc3\xa9 \xe2\x82\xac \xf0\x9f\x98\x80", "caf\xc3\xa9 \xe2\x82\xac \xf0\x9f\x98\x80"},
+      {"\xc2\x9b"
+       "31m",
+       "\\x9b"
+       "31m"},  // a control character of two bytes
+      {"\xe2\x80\xae"
+       "abc",
+       "\\u202e"
+       "abc"},  // writes from right to left
+      {"a\xe2\x80\x8b"
+       "b",
+       "a\\u200b"
+       "b"},  // has no width
+      {"\xef\xbb\xbf", "\\ufeff"},
+      {"\xff\xfe", "\\xff\\xfe"},
+      {"\xc3", "\\xc3"},  // cut
+      {"\xc3(", "\\xc3("},
+      {"\xc0\xaf", "\\xc0\\xaf"},  // longer than need be
+      {"\xe0\x80\xaf", "\\xe0\\x80\\xaf"},
+      {"\xed\xa0\x80", "\\xed\\xa0\\x80"},           // half of a pair
+      {"\xf4\x90\x80\x80", "\\xf4\\x90\\x80\\x80"},  // beyond the last character
+      {"\x80", "\\x80"},
+  };
+  for (TRow const& row : rows) EXPECT_EQ(Printable(row.text), row.printable) << testing::PrintToString(row.text);
+}
+
+TEST(TextTest, OnlyBytesThatNoArgumentOrDocumentCanHoldAreEscaped) {
+  EXPECT_EQ(WithBytesEscaped("caf\xc3\xa9 \x1b\n\xc2\x9b\xe2\x80\xae"), "caf\xc3\xa9 \x1b\n\xc2\x9b\xe2\x80\xae");
+  EXPECT_EQ(WithBytesEscaped(std::string("a\0b\xff\xc3", 5)), "a\\x00b\\xff\\xc3");
+}
+
+TEST(TextTest, EveryByteBecomesPrintable) {
+  for (int byte = 0; byte < 256; ++byte) {
+    std::string const text = Printable(std::string(1, static_cast<char>(byte)));
+    for (char c : text) EXPECT_TRUE(c >= 0x20 && c < 0x7f) << byte;
+  }
+}
+
+TEST(TextTest, WidthCountsCharacters) {
+  EXPECT_EQ(WidthOf(""), 0u);
+  EXPECT_EQ(WidthOf("caf\xc3\xa9"), 4u);
+}
+
+TEST(TextTest, LongTextsAreBrokenAtBlanks) {
+  EXPECT_THAT(Wrapped("", 5), ElementsAre(""));
+  EXPECT_THAT(Wrapped("12345", 5), ElementsAre("12345"));
+  EXPECT_THAT(Wrapped("12345 789", 5), ElementsAre("12345", "789"));
+  EXPECT_THAT(Wrapped("one two three", 7), ElementsAre("one two", "three"));
+  EXPECT_THAT(Wrapped("one two three", 6), ElementsAre("one", "two", "three"));
+  EXPECT_THAT(Wrapped("1234567890", 4), ElementsAre("1234", "5678", "90"));
+  EXPECT_THAT(Wrapped("a 1234567890", 4), ElementsAre("a", "1234", "5678", "90"));
+  EXPECT_THAT(Wrapped("   ", 1), ElementsAre(""));
+  EXPECT_THAT(Wrapped("a    b", 2), ElementsAre("a", "b"));
+  EXPECT_THAT(Wrapped("ends in blanks   ", 14), ElementsAre("ends in blanks"));
+  EXPECT_THAT(Wrapped("\xc3\xa9\xc3\xa9\xc3\xa9", 2), ElementsAre("\xc3\xa9\xc3\xa9", "\xc3\xa9"));
+}
+
+TEST(TextTest, ATableKeepsItsColumns) {
+  TTable table({6, 8, 4});
+  table.Add({"Name", "Value", "By"});
+  table.Add({"a", "one two three", "x"});
+  table.Add({"long name", "v", "y"});
+  table.Add({"b", "", "z"});
+  EXPECT_EQ(table.GetText(),
+            "Name    Value     By\n"
+            "a       one two   x\n"
+            "        three\n"
+            "long    v         y\n"
+            "name\n"
+            "b                 z\n");
+}
+
+TEST(TextTest, AColumnIsAsWideAsItsLongestWord) {
+  TTable table({6, 8, 62});
+  table.Add({"Name", "Value", "By"});
+  table.Add({"ConfiguredMemoryClockSpeed", "v", "x"});
+  std::string const blanks(22, ' ');
+  EXPECT_EQ(table.GetText(), "Name" + blanks + "  Value     By\nConfiguredMemoryClockSpeed  v         x\n");
+}
+
+TEST(TextTest, ColumnsGiveWhatTheyDoNotNeed) {
+  TTable table({4, 20});
+  table.Add({"1234567890", "one two three four"});
+  EXPECT_EQ(table.TextFor(ELayout::kFile, 26), "1234567890  one two three\n            four\n");
+  EXPECT_EQ(table.TextFor(ELayout::kFile, 20), "1234567890  one two\n            three\n            four\n");
+}
+
+TEST(TextTest, AWordThatTakesMostOfTheLineIsCut) {
+  TTable table({4, 10, 4});
+  table.Add({"a", "12345678901234567890", "b"});
+  table.Add({"c", "1234567890 12345", "d"});
+  EXPECT_EQ(table.TextFor(ELayout::kFile, 24),
+            "a     1234567890  b\n"
+            "      1234567890\n"
+            "c     1234567890  d\n"
+            "      12345\n");
+}
+
+TEST(TextTest, ATerminalGivesWideColumnsWhatItHas) {
+  TTable table({6, 8});
+  table.Add({"one two", "three four five six"});
+  EXPECT_EQ(table.TextFor(ELayout::kFile, 80), "one     three\ntwo     four\n        five six\n");
+  EXPECT_EQ(table.TextFor(ELayout::kTerminal, 22), "one     three four\ntwo     five six\n");
+  EXPECT_EQ(table.TextFor(ELayout::kTerminal, 80), "one two  three four five six\n");
+}
+
+TEST(TextTest, OnADumbTerminalARowIsOneLine) {
+  TTable table({6, 8});
+  table.Add({"one two", "three four five six"});
+  table.Add({"a", "b"});
+  EXPECT_EQ(table.TextFor(ELayout::kPlain, 20), "one two  three four five six\na        b\n");
+}
+
+TEST(TextTest, CellsAreMadePrintable) {
+  TTable table({20});
+  table.Add({"\x1b[2J\n"});
+  EXPECT_EQ(table.GetText(), "\\x1b[2J\\x0a\n");
+}
+
+TEST(TextTest, SizesAreRoundedOrExact) {
+  struct TRow {
+    std::uint64_t bytes;
+    char const *rounded, *exact;
+  } const rows[] = {
+      {0, "0 B", "0 bytes"},
+      {1023, "1023 B", "1023 bytes"},
+      {1024, "1 KiB", "1 KiB"},
+      {1025, "1 KiB", "1025 bytes"},
+      {1536, "1.5 KiB", "1536 bytes"},
+      {400000, "390.6 KiB", "400000 bytes"},
+      {1048524, "1023.9 KiB", "1048524 bytes"},
+      {1048525, "1 MiB", "1048525 bytes"},
+      {1048575, "1 MiB", "1048575 bytes"},
+      {7864320, "7.5 MiB", "7680 KiB"},
+      {8535000000, "7.9 GiB", "8535000000 bytes"},
+      {2199023255552, "2 TiB", "2 TiB"},
+      {1152921504606846976, "1048576 TiB", "1048576 TiB"},
+  };
+  for (TRow const& row : rows) {
+    EXPECT_EQ(SizeText(row.bytes), row.rounded) << row.bytes;
+    EXPECT_EQ(ExactSizeText(row.bytes), row.exact) << row.bytes;
+  }
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

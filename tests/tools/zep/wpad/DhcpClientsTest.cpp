@@ -1,0 +1,47 @@
+#include "tools/zep/wpad/DhcpClients.h"
+
+#include "tests/Support.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <filesystem>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+// A directory whose program "ps" prints a line with that beginning, and another end each time.
+class TChangingLine {
+public:
+  explicit TChangingLine(std::string const& beginning) : fPath(std::getenv("PATH")) {
+    std::string const program = fDirectory.Path("ps");
+    WriteFile(program, "#!/bin/sh\necho >> \"$0.count\"\necho \"" + beginning + " x$(wc -l < \"$0.count\") dhclient\"\n");
+    std::filesystem::permissions(program, std::filesystem::perms::owner_all);
+    ::setenv("PATH", (fDirectory.Path() + ":" + fPath).c_str(), 1);
+  }
+  ~TChangingLine() { ::setenv("PATH", fPath.c_str(), 1); }
+
+private:
+  TTempDir fDirectory;
+  std::string fPath;
+};
+
+TEST(DhcpClientsTest, OnlyThePlainNumberOfAProcessIsTaken) {
+  for (std::string const number : {"0", "02", "0000001", "12345678", "4294967298"})
+    EXPECT_NE(WhyNotToBeEnded({" " + number + " ? 00:00:00 dhclient"})
+                  .find(" is wrong: " + number + " is not the number of a process. Nothing was ended."),
+              std::string::npos)
+        << number;
+  EXPECT_EQ(WhyNotToBeEnded({"dhclient without a number"}), "") << "ends nothing";
+}
+
+TEST(DhcpClientsTest, ALineIsTheSameWhoseNumberIs) {
+  TChangingLine const line("9999999");  // which no process can have
+  std::vector<std::string> const lines = DhcpClientLines();
+  ASSERT_EQ(lines.size(), 1u);
+  ASSERT_NE(lines, DhcpClientLines());
+  EXPECT_NE(WhyNotToBeEnded(lines).find(" is wrong: there is no process 9999999. Nothing was ended."), std::string::npos);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

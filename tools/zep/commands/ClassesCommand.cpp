@@ -1,0 +1,148 @@
+// zep classes: the classes of the providers' namespaces, or of a schema.
+
+#include "tools/zep/ClassTree.h"
+#include "tools/zep/PlugIns.h"
+#include "tools/zep/Sample.h"
+#include "tools/zep/commands/Commands.h"
+#include "tools/zep/commands/MofFile.h"
+#include "tools/zep/output/ExitStatus.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Json.h"
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/Text.h"
+
+#include <CLI/CLI.hpp>
+
+#include <algorithm>
+#include <iostream>
+#include <memory>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  bool fAsTree = false;
+  bool fAsJson = false;
+  bool fSample = false;
+  std::string fMofFile;
+};
+
+struct TNamespaceClasses {
+  std::string fProvider, fNamespace;
+  std::vector<TClassEntry> fClasses;
+};
+
+// "abstract association", or nothing.
+std::string KindOf(TClassEntry const& entry) {
+  std::string kind;
+  auto const add = [&kind](bool is, char const* word) {
+    if (is) kind += (kind.empty() ? "" : " ") + std::string(word);
+  };
+  add(entry.fIsAbstract, "abstract");
+  add(entry.fIsAssociation, "association");
+  add(entry.fIsIndication, "indication");
+  return kind;
+}
+
+std::string TableOf(std::vector<TClassEntry> const& classes) {
+  TTable table({36, 28, 12});
+  table.Add({"Class", "Superclass", "Kind"});
+  for (TClassEntry const& entry : classes) table.Add({entry.fName, entry.fSuperClass, KindOf(entry)});
+  return table.GetText();
+}
+
+std::string TreeOf(std::vector<TClassEntry> const& classes) {
+  std::string text;
+  for (TClassEntry const& entry : classes) {
+    std::string const kind = KindOf(entry);
+    text += std::string(2 * entry.fDepth, ' ') + Printable(entry.fName) + (kind.empty() ? "" : " (" + kind + ")") + "\n";
+  }
+  return text;
+}
+
+std::string AsText(std::vector<TNamespaceClasses> const& namespaces, bool asTree) {
+  std::string text;
+  for (TNamespaceClasses const& ns : namespaces) {
+    if (ns.fClasses.empty()) continue;
+    std::string const count = std::to_string(ns.fClasses.size()) + (ns.fClasses.size() == 1 ? " class" : " classes");
+    std::string const label = IsSampleSelected() ? std::string(kSampleLabel) + " " : "";
+    text += text.empty() ? "" : "\n";
+    text += Printable(label + ns.fNamespace + " (" + ns.fProvider + "): " + count) + "\n\n";
+    text += asTree ? TreeOf(ns.fClasses) : TableOf(ns.fClasses);
+  }
+  return text;
+}
+
+struct TClasses {
+  std::vector<TNamespaceClasses> fNamespaces;
+  std::vector<std::string> fFailures;  // of the providers
+
+  bool IsEmpty() const {
+    return std::all_of(fNamespaces.begin(), fNamespaces.end(), [](TNamespaceClasses const& ns) { return ns.fClasses.empty(); });
+  }
+  EExitStatus ExitStatus() const { return IsEmpty() ? kExitNothing : fFailures.empty() ? kExitComplete : kExitPartial; }
+
+  // Why not everything is shown, a reason each.
+  std::vector<std::string> Reasons() const {
+    std::vector<std::string> reasons = fFailures;
+    if (IsEmpty()) reasons.push_back("there is no class");
+    return reasons;
+  }
+};
+
+std::string AsJson(TClasses const& found) {
+  TJson document = DocumentHead("zep classes", found.ExitStatus(), Joined(found.Reasons(), "; "));
+  document["namespaces"] = TJson::array();
+  for (TNamespaceClasses const& ns : found.fNamespaces) {
+    TJson classes = TJson::array();
+    for (TClassEntry const& entry : ns.fClasses)
+      classes.push_back({{"name", entry.fName},
+                         {"superClass", entry.fSuperClass.empty() ? TJson(nullptr) : TJson(entry.fSuperClass)},
+                         {"abstract", entry.fIsAbstract},
+                         {"association", entry.fIsAssociation},
+                         {"indication", entry.fIsIndication},
+                         {"depth", entry.fDepth}});
+    document["namespaces"].push_back({{"provider", ns.fProvider}, {"namespace", ns.fNamespace}, {"classes", classes}});
+  }
+  return zep::AsText(document);
+}
+
+TClasses FindClasses(TArguments const& arguments) {
+  TClasses classes;
+  bool const isMof = !arguments.fMofFile.empty();
+  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugIns();
+  classes.fFailures = FailuresOf(plugIns);
+  for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
+    std::string const failure = FailureOf([&] {
+      classes.fNamespaces.push_back({view.GetProviderName(), view.GetName(), ClassesOf(*view.Get())});
+    });
+    if (!failure.empty()) classes.fFailures.push_back(view.GetProviderName() + ": " + failure);
+  }
+  return classes;
+}
+
+int Classes(TArguments const& arguments) {
+  if (arguments.fSample) SelectSample();
+  TClasses const classes = FindClasses(arguments);
+  WriteOutput(arguments.fAsJson ? AsJson(classes) : AsText(classes.fNamespaces, arguments.fAsTree));
+  for (std::string const& reason : classes.Reasons()) std::cerr << "zep: " << Printable(reason) << "\n";
+  return classes.ExitStatus();
+}
+
+}  // namespace
+
+TRun AddClassesArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  command.add_flag("--tree", arguments->fAsTree, "Show each class indented below its superclass");
+  auto* const mof = command.add_option("--mof", arguments->fMofFile, "Show the classes of this MOF file, not the providers'");
+  command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  command.add_flag("--sample", arguments->fSample, "Let the host provider describe the bundled sample, labelled SAMPLE")
+      ->excludes(mof);
+  command.footer(
+      "Exit status: 0 when there are classes, 2 when there are but a plug-in failed, 1 when there are none,\n"
+      "64 for wrong usage.");
+  return [arguments] { return Classes(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,103 @@
+// zep get: a file from an FTP or SFTP server.
+
+#include "tools/zep/commands/Commands.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/processes/Interrupts.h"
+#include "tools/zep/transfer/Transfer.h"
+
+#include <unistd.h>
+
+#include <CLI/CLI.hpp>
+
+#include <filesystem>
+#include <iostream>
+#include <memory>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  std::string fUrl, fFile;
+  bool fForce = false, fNoClobber = false, fAsJson = false;
+  TTransferOptions fOptions;
+};
+
+namespace fs = std::filesystem;
+
+// Of a symbolic link what it leads to: that is written, and the link stays.
+std::string WithoutLinks(std::string const& file) {
+  std::error_code nowhere;
+  if (!fs::is_symlink(fs::symlink_status(file, nowhere))) return file;
+  fs::path const target = fs::canonical(file, nowhere);
+  return nowhere ? file : target.string();
+}
+
+bool IsOverwritingWanted(std::string const& file) {
+  std::cerr << "zep: " << Printable(file) << " exists; overwrite it? (y/n): " << std::flush;
+  std::string answer;
+  std::getline(std::cin, answer);
+  return answer == "y" || answer == "Y";
+}
+
+// Why the file may not be written; empty when it may. Asks only where somebody can answer. A device and the like is never
+// replaced, nor a link that leads nowhere.
+std::string WhyNotWritten(TArguments const& arguments, std::string const& file, fs::file_status const& status) {
+  if (!fs::exists(status)) return "";
+  if (fs::is_directory(status)) return Printable(file) + " is a directory";
+  if (!fs::is_regular_file(status)) return Printable(file) + " is not a regular file";
+  if (arguments.fForce) return "";
+  if (!arguments.fNoClobber && ::isatty(STDIN_FILENO))
+    return IsOverwritingWanted(file) ? "" : Printable(file) + " is left as it is";
+  return Printable(file) + " exists" + (arguments.fNoClobber ? "" : "; --force overwrites it");
+}
+
+int Refuse(TRemote const& source, std::string const& file, std::string const& why, bool asJson) {
+  TTransferred refused;
+  refused.fOutcome = {kZEPStatusAlreadyExists, kExitNotWritten, why};
+  refused.fUrl = ShownUrlOf(source);
+  refused.fFile = file;
+  if (asJson) WriteOutput(AsText(DocumentOf(refused, "zep get")));
+  std::cerr << "zep: " << why << "\n";
+  return kExitNotWritten;
+}
+
+int Get(TArguments const& arguments) {
+  if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the URL comes first, and the file behind it");
+  TTarget const source = TargetOf(arguments.fUrl, false);
+  if (source.fIsHost) throw TWrongUsage("a URL is needed, ftp:// or sftp://");
+  std::string const file = WithoutLinks(arguments.fFile);
+  std::error_code unknown;
+  fs::file_status const status = fs::symlink_status(file, unknown);
+  std::string const why = WhyNotWritten(arguments, file, status);
+  if (!why.empty()) return Refuse(source.fRemote, file, why, arguments.fAsJson);
+  TInterruptGuard const guard;
+  bool const overwrites = fs::exists(status) || arguments.fForce;
+  TTransferred const fetched = GetFile(source.fRemote, file, overwrites, arguments.fOptions);
+  return TellOf(fetched, "zep get", arguments.fAsJson, arguments.fOptions);
+}
+
+}  // namespace
+
+TRun AddGetArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  command.add_option("url", arguments->fUrl, "ftp://[USER@]HOST[:PORT]/PATH or sftp://...")->required();
+  command.add_option("file", arguments->fFile, "The file to write")->required();
+  CLI::Option* const force = command.add_flag("--force", arguments->fForce, "Overwrite the file without asking");
+  command.add_flag("--no-clobber", arguments->fNoClobber, "Leave a file that is there as it is, without asking")->excludes(force);
+  command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  AddSizeOption(command, "--max-size", arguments->fOptions.fMostBytes,
+                "The most bytes that are fetched (10 GiB), such as 500K, 2M or 1G; 0: no limit");
+  AddTransferOptions(command, arguments->fOptions);
+  command.footer(
+      "A file that is there is overwritten after a question, which is asked on a terminal only; of a symbolic link the file\n"
+      "that it leads to. Until all has arrived the file has \".part\" after its name. A broken transfer leaves that file, and "
+      "the\n"
+      "next one goes on with it where the server can start in the middle and tells (FTP: by MDTM) that the file has the same\n"
+      "time as before; otherwise all of it is fetched again.\n" +
+      TransferHelp());
+  return [arguments] { return Get(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,62 @@
+// zep help: how zep, or one of its commands, is called.
+
+#include "tools/zep/commands/Commands.h"
+#include "tools/zep/output/ExitStatus.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Json.h"
+#include "tools/zep/output/Output.h"
+
+#include <CLI/CLI.hpp>
+
+#include <memory>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  std::vector<std::string> fCommand;  // "media mount"; empty for zep itself
+  bool fAsJson = false;
+};
+
+// A word that is not a command may be a password, and is not repeated.
+std::string HelpOf(CLI::App const& zep, std::vector<std::string> const& words) {
+  CLI::App const* command = &zep;
+  std::string before;
+  for (std::string const& word : words) {
+    before += (before.empty() ? "" : " ") + command->get_name();
+    command = CommandNamed(*command, word);
+    if (command == nullptr) throw TWrongUsage("there is no such command; zep --help lists them");
+  }
+  auto const formatter = std::dynamic_pointer_cast<CLI::Formatter>(command->get_formatter());
+  return formatter->make_help(command, before.empty() ? command->get_name() : before + " " + command->get_name(),
+                              CLI::AppFormatMode::Normal);
+}
+
+int Help(CLI::App const& zep, TArguments const& arguments) {
+  std::string const help = HelpOf(zep, arguments.fCommand);
+  TJson document = DocumentHead("zep help", kExitComplete, "");
+  document["text"] = help;
+  WriteOutput(arguments.fAsJson ? AsText(document) : help);
+  return kExitComplete;
+}
+
+}  // namespace
+
+CLI::App const* CommandNamed(CLI::App const& app, std::string const& name) {
+  for (CLI::App const* const command : app.get_subcommands({}))
+    if (command->get_name() == name) return command;
+  return nullptr;
+}
+
+TRun AddHelpArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  command.add_option("command", arguments->fCommand, "The command; without one, all commands are listed");
+  command.add_flag("--json", arguments->fAsJson, "Print one JSON document, with the text in it");
+  command.footer(
+      "The same as zep --help and zep COMMAND --help.\n"
+      "Exit status: 0, or 64 when there is no such command.");
+  return [zep = command.get_parent(), arguments] { return Help(*zep, *arguments); };
+}
+
+}  // namespace NQRVZEP20::zep

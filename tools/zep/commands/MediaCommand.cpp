@@ -1,0 +1,126 @@
+// zep media: the removable media of this machine.
+
+#include "tools/zep/commands/Commands.h"
+#include "tools/zep/media/Media.h"
+#include "tools/zep/media/TMountedMedium.h"
+#include "tools/zep/output/ExitStatus.h"
+#include "tools/zep/output/Json.h"
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/Text.h"
+
+#include <CLI/CLI.hpp>
+
+#include <iostream>
+#include <memory>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  bool fAsJson = false;
+  std::string fDevice;     // to mount
+  std::string fDirectory;  // to unmount
+};
+
+TJson SizeAsJson(std::uint64_t size) { return size == 0 ? TJson(nullptr) : TJson(size); }
+
+std::string OrDash(std::string const& text) { return text.empty() ? "-" : text; }
+
+std::string MountedAt(TMedium const& medium) {
+  std::string text;
+  for (std::string const& mountPoint : medium.fMountPoints) text += (text.empty() ? "" : " ") + mountPoint;
+  return OrDash(text) + (medium.fIsReadOnly ? " (read-only)" : "");
+}
+
+std::string AsText(std::vector<TMedium> const& media) {
+  TTable table({12, 9, 11, 11, 12, 15});
+  table.Add({"Device", "Size", "Label", "File system", "Mounted at", "What it is"});
+  for (TMedium const& medium : media)
+    table.Add({medium.fDevice, medium.fSize == 0 ? "-" : SizeText(medium.fSize), OrDash(medium.fLabel),
+               OrDash(medium.fFileSystem), MountedAt(medium), OrDash(medium.fDescription)});
+  return table.GetText();
+}
+
+std::string AsJson(std::vector<TMedium> const& media, EExitStatus status, std::string const& reason) {
+  TJson document = DocumentHead("zep media", status, reason);
+  document["labelsReadable"] = AreLabelsReadable();
+  document["media"] = TJson::array();
+  for (TMedium const& medium : media)
+    document["media"].push_back({{"device", medium.fDevice},
+                                 {"description", OrNull(medium.fDescription)},
+                                 {"size", SizeAsJson(medium.fSize)},
+                                 {"label", OrNull(medium.fLabel)},
+                                 {"fileSystem", OrNull(medium.fFileSystem)},
+                                 {"readOnly", medium.fIsReadOnly},
+                                 {"mounted", !medium.fMountPoints.empty()},
+                                 {"mountPoints", medium.fMountPoints}});
+  return zep::AsText(document);
+}
+
+// Why the list is empty or lacks something; empty when it does not.
+std::string WhatIsMissing(std::vector<TMedium> const& media) {
+  if (media.empty()) return "there is no removable medium";
+  return AreLabelsReadable() ? "" : "labels and file systems can be read by root only";
+}
+
+int List(bool asJson) {
+  std::vector<TMedium> const media = FindMedia();
+  std::string const missing = WhatIsMissing(media);
+  EExitStatus const status = media.empty() ? kExitNothing : missing.empty() ? kExitComplete : kExitPartial;
+  if (!media.empty() || asJson) WriteOutput(asJson ? AsJson(media, status, missing) : AsText(media));
+  if (!missing.empty()) std::cerr << "zep: " << missing << "\n";
+  return status;
+}
+
+int Mount(std::string const& device, bool asJson) {
+  TMountedMedium const medium(device);
+  TJson document = DocumentHead("zep media mount", kExitComplete, "");
+  document["device"] = medium.Device();
+  document["mountPoint"] = medium.MountPoint();
+  WriteMessage(asJson ? zep::AsText(document) : medium.Device() + " is mounted at " + medium.MountPoint() + "\n");
+  return kExitComplete;
+}
+
+int Unmount(std::string const& argument, bool asJson) {
+  std::string const directory = WithoutTrailingSlashes(argument);
+  std::vector<std::string> const stillMountedAt = UnmountDirectory(directory);
+  EExitStatus const status = stillMountedAt.empty() ? kExitComplete : kExitPartial;
+  std::string const why = stillMountedAt.empty() ? "" : "the medium " + WhetherToTakeOut(stillMountedAt);
+  TJson document = DocumentHead("zep media umount", status, why);
+  document["mountPoint"] = directory;
+  document["stillMountedAt"] = stillMountedAt;
+  WriteMessage(asJson ? zep::AsText(document)
+                      : directory + " is unmounted; the medium " + WhetherToTakeOut(stillMountedAt) + "\n");
+  return status;
+}
+
+int Media(TArguments const& arguments) {
+  if (!arguments.fDevice.empty()) return Mount(arguments.fDevice, arguments.fAsJson);
+  if (!arguments.fDirectory.empty()) return Unmount(arguments.fDirectory, arguments.fAsJson);
+  return List(arguments.fAsJson);
+}
+
+}  // namespace
+
+TRun AddMediaArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  CLI::App* const list = command.add_subcommand(kListMedia, "List them, which is also done without a word");
+  CLI::App* const mount = command.add_subcommand("mount", "Mount one at /mnt/key, a floppy at /mnt/floppy");
+  CLI::App* const unmount = command.add_subcommand("umount", "Unmount one, so that it can be taken out");
+  mount->add_option("device", arguments->fDevice, "The device, such as /dev/sdb; its first partition is tried as well")
+      ->required();
+  unmount->add_option("directory", arguments->fDirectory, "Where it is mounted")->required();
+  for (CLI::App* const each : {&command, list, mount, unmount})
+    each->add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  command.require_subcommand(0, 1);
+  command.footer(
+      "Listed are USB disks, floppies and CD-ROMs with a medium, as lsblk shows them. Mounting needs root.\n"
+      "Exit status: 0 when it was done, 2 when labels are missing from the list or when the drive of what was\n"
+      "unmounted is mounted elsewhere too, 1 when there is no medium or it could not be done, 64 for wrong usage,\n"
+      "which a name with other characters than letters, digits, \"/\", \"-\", \"_\" and \".\" is, or a device that is\n"
+      "not below /dev, or a directory that is not below /mnt, /media or /run/media.");
+  return [arguments] { return Media(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,16 @@
+#include "tools/zep/commands/MofFile.h"
+
+#include "providers/memory/TMemoryNamespace.h"
+#include "providers/mof/Mof.h"
+
+#include <boost/make_shared.hpp>
+
+namespace NQRVZEP20::zep {
+
+TNamespaceView ViewOfMof(std::string const& file) {
+  auto const ns = boost::make_shared<TMemoryNamespace>("mof");
+  ReadMofFile(file, ns);
+  return TNamespaceView(file, ns);
+}
+
+}  // namespace NQRVZEP20::zep

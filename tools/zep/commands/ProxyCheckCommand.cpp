@@ -1,0 +1,140 @@
+// zep proxy-check: whether a web proxy lets a request through.
+
+#include "TOSSpecific.h"
+#include "tools/zep/commands/Commands.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/processes/Interrupts.h"
+#include "tools/zep/processes/TScratchDirectory.h"
+#include "tools/zep/secrets/Secrets.h"
+#include "tools/zep/transfer/Transfer.h"
+#include "tools/zep/transfer/Unreachable.h"
+
+#include <CLI/CLI.hpp>
+
+#include <filesystem>
+#include <fstream>
+#include <iostream>
+#include <memory>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  std::string fProxy;
+  bool fAsJson = false;
+  std::uint64_t fMostBytes = 1 << 20;
+  TTransferOptions fOptions;
+};
+
+// Passwords are hidden before the text is cut, which might cut one.
+std::string FirstLineOf(std::string const& whole) {
+  constexpr std::size_t kLongest = 200;
+  std::string const text = WithoutSecrets(whole);
+  return Printable(text.substr(0, std::min(kLongest, text.find_first_of("\r\n"))));
+}
+
+// The title of a web page, such as that of a proxy's refusal; else its first line.
+std::string AnswerIn(std::string const& page) {
+  if (page.empty()) return "nothing came back";
+  std::string const start = "<title>";
+  std::size_t const title = page.find(start), end = page.find("</title>");
+  if (title == page.npos || end == page.npos || end < title) return "what came back begins with: " + FirstLineOf(page);
+  return "the title of the page that arrived is: " + FirstLineOf(page.substr(title + start.size(), end - title - start.size()));
+}
+
+// A file of any size, of which no more than a piece is in memory at a time.
+bool HoldsText(std::string const& file, std::string const& text) {
+  std::ifstream stream(file, std::ios::binary);
+  std::string piece, chunk(65536, '\0');
+  while (stream.read(chunk.data(), static_cast<std::streamsize>(chunk.size())), stream.gcount() > 0) {
+    piece.append(chunk, 0, static_cast<std::size_t>(stream.gcount()));
+    if (piece.find(text) != piece.npos) return true;
+    piece.erase(0, piece.size() - std::min(piece.size(), text.size() - 1));  // the end may be a beginning of it
+  }
+  return false;
+}
+
+std::string BeginningOf(std::string const& file) {
+  std::string text(65536, '\0');
+  std::ifstream stream(file, std::ios::binary);
+  stream.read(text.data(), static_cast<std::streamsize>(text.size()));
+  text.resize(static_cast<std::size_t>(stream.gcount()));
+  return text;
+}
+
+bool IsCutAt(std::string const& file, std::uint64_t mostBytes) {
+  std::error_code absent;
+  return mostBytes > 0 && std::filesystem::file_size(file, absent) >= mostBytes && !absent;
+}
+
+// The library gives libcurl's words, which name no remedy.
+void ExplainNoConnection(TOutcome& outcome, TRemote const& proxy) {
+  constexpr int kProbeSeconds = 3;
+  std::string const why = WhyUnreachable(proxy.fHost, proxy.fPort, kProbeSeconds);
+  if (!why.empty()) outcome.fReason = Printable(why);
+}
+
+// Something may come back from the proxy itself: its refusal, or that it cannot reach the page. So the page has to be the one.
+TOutcome Check(TRemote const& proxy, TArguments const& arguments) {
+  TScratchDirectory const scratch("zep-proxy-check");  // the library writes the page into the working directory
+  std::string const pageFile = scratch.Path("content.html");
+  TWatch const watch{pageFile, nullptr, arguments.fOptions.fStallSeconds, arguments.fMostBytes, {}};
+  TOutcome outcome = RunWatched(
+      [&] {
+        std::filesystem::current_path(scratch.Path());
+        return TOSSpecific::CheckProxySetting(proxy.fHost, proxy.fPort, UserAndPasswordOf(proxy), 0);
+      },
+      watch);
+  bool const isCut = outcome.fExit == kExitNothing && IsCutAt(pageFile, arguments.fMostBytes);
+  if (outcome.fExit == kExitNoConnection) ExplainNoConnection(outcome, proxy);
+  if (outcome.fExit != kExitComplete && !isCut) return outcome;
+  if (HoldsText(pageFile, ZEP_PROXY_CHECK_TEXT)) return {};
+  std::string const size = isCut ? ", and is larger than " + ExactSizeText(arguments.fMostBytes) + " (--max-page)" : "";
+  return {kZEPStatusAccessDenied, kExitNothing, "the page did not come through; " + AnswerIn(BeginningOf(pageFile)) + size};
+}
+
+int Tell(std::string const& proxy, TOutcome const& outcome, bool asJson, bool quiet) {
+  bool const works = outcome.fExit == kExitComplete;
+  if (asJson) {
+    TJson document = DocumentHead("zep proxy-check", outcome.fExit, outcome.fReason);
+    document["proxy"] = proxy;
+    document["works"] = works;
+    WriteOutput(AsText(document));
+  } else if (works && !quiet) {
+    WriteMessage("The proxy " + proxy + " lets requests through.\n");
+  }
+  if (!works) std::cerr << "zep: proxy " << proxy << ": " << outcome.fReason << "\n";
+  return outcome.fExit;
+}
+
+int ProxyCheck(TArguments const& arguments) {
+  TRemote proxy = RemoteOf(arguments.fProxy, "http");
+  if (proxy.fScheme != "http" || !proxy.fPath.empty()) throw TWrongUsage("a proxy is [USER@]HOST:PORT");
+  if (proxy.fPort.empty()) throw TWrongUsage("the port of the proxy is missing");
+  FindPassword(proxy, arguments.fOptions.fNetrc);
+  HideLogin(proxy.fUser, proxy.fPassword.View());
+  TInterruptGuard const guard;
+  return Tell(Printable(proxy.fHost + ":" + proxy.fPort), Check(proxy, arguments), arguments.fAsJson, arguments.fOptions.fQuiet);
+}
+
+}  // namespace
+
+TRun AddProxyCheckArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  command.add_option("proxy", arguments->fProxy, "[USER@]HOST:PORT")->required();
+  command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  AddSizeOption(command, "--max-page", arguments->fMostBytes,
+                "The most bytes of the page that are fetched (1 MiB), such as 500K or 2M; 0: no limit");
+  AddTransferOptions(command, arguments->fOptions);
+  command.footer(
+      "A web page is fetched through the proxy; the check is passed when it is that page which comes back.\n"
+      "The password comes from netrc or from a prompt.\n"
+      "Exit status: 0 when the page came back, 1 when something else did, 64 for wrong usage, 68 when the proxy is unknown or\n"
+      "does not answer, 69 without libcurl, 75 when nothing moved for too long.");
+  return [arguments] { return ProxyCheck(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,141 @@
+// zep report: which machine this is.
+
+#include "tools/zep/Report.h"
+#include "tools/zep/Sample.h"
+#include "tools/zep/commands/Commands.h"
+#include "tools/zep/media/TMountedMedium.h"
+#include "tools/zep/output/Json.h"
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/processes/Interrupts.h"
+#include "tools/zep/transfer/SendReport.h"
+
+#include <CLI/CLI.hpp>
+
+#include <iostream>
+#include <memory>
+#include <optional>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+constexpr char const* kToMedia = "zep report --to-media";
+
+struct TArguments {
+  bool fAsJson = false;
+  bool fSample = false;
+  bool fBySftp = false;
+  std::string fTarget;  // empty: nowhere
+  TTransferOptions fOptions;
+  std::string fMedium;  // the device to write to; empty for standard output
+};
+
+// Where it is still mounted. Also unmounts a medium that could not be written; the reason for that is the one that counts.
+std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::string const& name, std::string const& text) {
+  try {
+    medium.Write(name, text);
+  } catch (std::runtime_error const&) {
+    try {
+      UnmountDirectory(medium.MountPoint());
+    } catch (std::runtime_error const& failure) {
+      std::cerr << "zep: " << Printable(failure.what()) << "\n";
+    }
+    throw;
+  }
+  try {
+    return UnmountDirectory(medium.MountPoint());
+  } catch (std::runtime_error const& failure) {
+    throw std::runtime_error(name + " is written on " + medium.Device() + ", but " + failure.what());
+  }
+}
+
+// Returns the document that tells of it.
+TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
+  std::string const name = ReportFileName(report, arguments.fAsJson ? ".json" : ".txt");
+  std::string const text = arguments.fAsJson ? AsVerbatimText(ReportAsJson(report)) : ReportAsText(report);
+  TMountedMedium const medium(arguments.fMedium);
+  std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);
+
+  TJson document = DocumentHead(kToMedia, report.fStatus, WhyNotComplete(report));
+  document["device"] = medium.Device();
+  document["file"] = name;
+  document["bytes"] = text.size();
+  document["stillMountedAt"] = stillMountedAt;
+  if (!arguments.fAsJson)
+    WriteMessage("The report is " + name + " on " + medium.Device() + ", which " + WhetherToTakeOut(stillMountedAt) + ".\n");
+  return document;
+}
+
+// The report's document, or that of the medium which the report was written to. For people it is printed by now.
+TJson PrintOrWrite(TReport const& report, TArguments const& arguments) {
+  if (!arguments.fMedium.empty()) return WriteToMedium(report, arguments);
+  if (!arguments.fAsJson) WriteOutput(ReportAsText(report));
+  return arguments.fAsJson ? ReportAsJson(report) : TJson();
+}
+
+// Adds what became of sending. A report that was not sent makes all of it a failure.
+void AddSending(TJson& document, TSentReport const& sent) {
+  TTransferred const& transferred = sent.fTransferred;
+  bool const isSent = transferred.fOutcome.fExit == kExitComplete;
+  if (!isSent) {
+    document["exitStatus"] = static_cast<int>(transferred.fOutcome.fExit);
+    document["reason"] = "it was not sent: " + transferred.fOutcome.fReason;
+  }
+  document["sent"] = {{"url", OrNull(transferred.fUrl)},
+                      {"bytes", isSent ? TJson(transferred.fBytes) : TJson(nullptr)},
+                      {"sha256", OrNull(transferred.fSha256)},
+                      {"keptIn", OrNull(sent.fKeptIn)}};
+}
+
+// The JSON document is printed at the end, as it tells what zep ends with.
+int MakeAndDeliver(TArguments const& arguments) {
+  TTarget target{};
+  if (!arguments.fTarget.empty()) target = TargetOf(arguments.fTarget, arguments.fBySftp);
+  if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
+  if (arguments.fSample) SelectSample();
+  TReport const report = MakeReport(LoadPlugIns());
+  EExitStatus status = report.fStatus;
+  TJson document = PrintOrWrite(report, arguments);
+  std::optional<TInterruptGuard> guard;
+  if (!arguments.fTarget.empty()) {
+    guard.emplace();
+    TSentReport const sent = SendReport(report, target, arguments.fOptions);
+    if (sent.fTransferred.fOutcome.fExit != kExitComplete) status = sent.fTransferred.fOutcome.fExit;
+    AddSending(document, sent);
+  }
+  if (arguments.fAsJson) WriteOutput(AsText(document));
+  return status;
+}
+
+int Report(TArguments const& arguments) {
+  try {
+    return MakeAndDeliver(arguments);
+  } catch (std::exception const& failure) {
+    bool const isOfMedium = !arguments.fMedium.empty() && arguments.fAsJson && !HasWrittenOutput();
+    if (isOfMedium) WriteOutput(FailureAsJson(kToMedia, StatusOf(failure), failure.what()));
+    throw;
+  }
+}
+
+}  // namespace
+
+TRun AddReportArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  command.add_flag("--sample", arguments->fSample, "Report on the bundled table of an invented server, labelled SAMPLE");
+  command.add_option("--to-media", arguments->fMedium,
+                     "Write the report to a file on this removable device, such as /dev/sdb, instead, and unmount it");
+  command.add_option("--send", arguments->fTarget,
+                     "Send the JSON document, packed, as well: ftp://[USER@]HOST[:PORT]/DIRECTORY/, sftp://..., or\n"
+                     "[USER@]HOST[:PORT] alone. When it cannot be sent it is kept, and where is said");
+  command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
+  AddTransferOptions(command, arguments->fOptions);
+  command.footer(
+      "Exit status: 0 when the identity is complete (the details do not count), 2 when something of it is missing or a\n"
+      "plug-in failed, 1 when nothing of it could be told or the medium could not be written and unmounted, 64 for wrong\n"
+      "usage; when it could not be sent, as that of zep send.");
+  return [arguments] { return Report(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,55 @@
+// zep send: a file to an FTP or SFTP server.
+
+#include "tools/zep/commands/Commands.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/processes/Interrupts.h"
+#include "tools/zep/transfer/Transfer.h"
+
+#include <CLI/CLI.hpp>
+
+#include <memory>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  std::string fFile, fTarget, fName;
+  bool fBySftp = false, fAsJson = false;
+  TTransferOptions fOptions;
+};
+
+int Send(TArguments const& arguments) {
+  if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the file comes first, and where it goes behind it");
+  TTarget const target = TargetOf(arguments.fTarget, arguments.fBySftp);
+  std::string const& path = target.fRemote.fPath;
+  bool const isNamed = !path.empty() && path.back() != '/';
+  if (isNamed && !arguments.fName.empty())
+    throw TWrongUsage("the URL names the file already; --as is for a host or a URL that ends in \"/\"");
+  TInterruptGuard const guard;
+  TTransferred const sent = SendFile(arguments.fFile, target, arguments.fName, arguments.fOptions);
+  return TellOf(sent, "zep send", arguments.fAsJson, arguments.fOptions);
+}
+
+}  // namespace
+
+TRun AddSendArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  command.add_option("file", arguments->fFile, "The file to send")->required();
+  command.add_option("target", arguments->fTarget, "ftp://[USER@]HOST[:PORT]/PATH, sftp://..., or [USER@]HOST[:PORT] alone")
+      ->required();
+  command.add_option("--as", arguments->fName,
+                     "The name there, instead of the file's own, for a host or a URL that ends in \"/\"");
+  command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
+  command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  AddTransferOptions(command, arguments->fOptions);
+  command.footer(
+      "Missing directories are made on the server. The file is sent under its name with a number and \".part\" after it, and is\n"
+      "renamed when all has arrived; a file of that name is then replaced. Where the server refuses that, the file is sent to\n"
+      "its place itself. A host gets the file in the directory of the user, or, when ZEP_ISBOOTABLE is \"yes\", in\n"
+      "hostline/toqrv/vantor/fdr_upload.\n" +
+      TransferHelp() + " 2 when the file changed while it was sent.");
+  return [arguments] { return Send(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,316 @@
+// zep show: one object or class, by its path.
+
+#include "ICIMClass.h"
+#include "ICIMInstance.h"
+#include "ICIMMethodDecl.h"
+#include "ICIMParameterDecl.h"
+#include "ICIMProperty.h"
+#include "ICIMPropertyDecl.h"
+#include "ICIMQualifier.h"
+#include "TCIMReference.h"
+#include "TZEPException.h"
+#include "tools/zep/PlugIns.h"
+#include "tools/zep/Sample.h"
+#include "tools/zep/ValueWords.h"
+#include "tools/zep/commands/Commands.h"
+#include "tools/zep/commands/MofFile.h"
+#include "tools/zep/output/ExitStatus.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Json.h"
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/Text.h"
+
+#include <CLI/CLI.hpp>
+
+#include <iostream>
+#include <map>
+#include <memory>
+#include <set>
+#include <sstream>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  std::string fPath;
+  bool fAsJson = false;
+  bool fSample = false;
+  std::string fMofFile;
+};
+
+// The namespace that a path names in front of its class; empty when it names none.
+std::string NamespaceOf(std::string const& path) {
+  std::size_t const end = path.find_first_of(":\"");
+  return end != std::string::npos && path[end] == ':' ? path.substr(0, end) : "";
+}
+
+// The instance of which zep prints that path, in a document or else on a terminal. Not every printed path can be read: that
+// of a key which is a reference stands raw, bytes that are no UTF-8 are escaped, and an instance without keys has a number.
+boost::shared_ptr<ICIMElement> FindPrinted(TNamespaceView const& view, std::string const& full) {
+  std::string const path = full.substr(view.GetName().size() + 1);
+  std::size_t const endOfClass = path.find_first_of(".#");
+  if (endOfClass == path.npos) return {};
+  auto const instances = view.InstancesOf(path.substr(0, endOfClass));
+  for (auto const& instance : instances)
+    if (view.PathOf(*instance) == full) return instance;
+  for (auto const& instance : instances)
+    if (Printable(view.PathOf(*instance)) == full) return instance;
+  return {};
+}
+
+boost::shared_ptr<ICIMElement> FindRead(TNamespaceView const& view, std::string const& full) {
+  try {
+    return TCIMReference(view.Get(), full, TCIMContext()).GetCIMElement(false);
+  } catch (TZEPException const& failure) {
+    EZEPStatusCode const status = failure.GetStatusCode().GetCode();
+    if (status != kZEPStatusInvalidReference && status != kZEPStatusNotFound) throw;
+    return {};
+  }
+}
+
+// What the path names in that namespace; empty when there is no such thing.
+boost::shared_ptr<ICIMElement> Find(TNamespaceView const& view, std::string const& path) {
+  std::string const named = NamespaceOf(path);
+  if (!named.empty() && named != view.GetName()) return {};
+  std::string const full = named.empty() ? view.GetName() + ":" + path : path;
+  auto const element = FindRead(view, full);
+  auto const instance = boost::dynamic_pointer_cast<ICIMInstance const>(element);
+  bool const isExact = element && (!instance || view.PathOf(*instance) == full);
+  auto const printed = isExact ? nullptr : FindPrinted(view, full);
+  return printed ? printed : element;
+}
+
+std::string Heading(std::string const& what) {
+  return Printable(IsSampleSelected() ? std::string(kSampleLabel) + " " + what : what) + "\n\n";
+}
+
+std::string InstanceAsText(TNamespaceView const& view, ICIMInstance const& instance) {
+  TTable table({24, 10, 42});
+  table.Add({"Property", "Type", "Value"});
+  instance.EnumerateProperties(
+      [&](boost::shared_ptr<ICIMProperty> property) {
+        std::string const name = property->GetName(TCIMContext());
+        TCIMValue const value = property->GetValue(TCIMContext());
+        std::string const reason = value.IsNull() ? ": " + view.WhyMissing(instance, name).fReason : "";
+        TValueWords const words(*property->GetDeclaration(TCIMContext()));
+        table.Add({name, NameOf(value.GetType()), words.TextOf(value) + reason});
+        return true;
+      },
+      TCIMContext());
+  return Heading(view.PathOf(instance)) + table.GetText();
+}
+
+// The class and those above it, the topmost first.
+std::vector<boost::shared_ptr<ICIMClass const>> LineageOf(boost::shared_ptr<ICIMClass const> cls) {
+  std::vector<boost::shared_ptr<ICIMClass const>> lineage;
+  for (; cls; cls = cls->GetSuperClass(TCIMContext())) lineage.insert(lineage.begin(), cls);
+  return lineage;
+}
+
+// Calls back with every property that instances of the class have. One that a class declares again is taken where it is
+// declared last.
+template <class TCallback>
+void ForEachProperty(ICIMClass const& cls, std::vector<boost::shared_ptr<ICIMClass const>> const& lineage, TCallback callback) {
+  std::set<std::string> seen;
+  for (auto const& ancestor : lineage)
+    ancestor->EnumeratePropertyDecls(
+        [&](boost::shared_ptr<ICIMPropertyDecl> property) {
+          std::string const name = property->GetName(TCIMContext());
+          if (seen.insert(name).second) callback(*cls.GetPropertyDecl(name, TCIMContext()));
+          return true;
+        },
+        TCIMContext());
+}
+
+// The class's own description, in lines, and an empty line; nothing when there is none.
+std::string DescriptionOf(ICIMClass const& cls) {
+  auto const qualifier = cls.GetQualifier("Description", TCIMContext());
+  TCIMValue const value = qualifier ? qualifier->GetValue(TCIMContext()) : TCIMValue();
+  if (value.IsNull()) return "";
+  std::string description = value.ToString();
+  for (char& c : description)
+    if (c == '\t' || c == '\r') c = ' ';
+  std::istringstream paragraphs(description);
+  std::string text;
+  for (std::string paragraph; std::getline(paragraphs, paragraph);)
+    for (std::string const& line : Wrapped(Printable(paragraph), OutputWidth())) text += line + "\n";
+  return text + "\n";
+}
+
+// What the values of the enumerated properties mean.
+std::string ValuesAsText(ICIMClass const& cls, std::vector<boost::shared_ptr<ICIMClass const>> const& lineage) {
+  TTable table({24, 54});
+  ForEachProperty(cls, lineage, [&](ICIMPropertyDecl const& property) {
+    TValueWords const words(property);
+    std::string values;
+    for (auto const& [entry, word] : words.Entries()) values += (values.empty() ? "" : ", ") + entry + " (" + word + ")";
+    if (!values.empty()) table.Add({property.GetName(TCIMContext()), values});
+  });
+  return table.IsEmpty() ? "" : "\nValues\n" + table.GetText();
+}
+
+std::string SignatureOf(ICIMMethodDecl const& method) {
+  std::string parameters;
+  method.EnumerateParameterDecls(
+      [&](boost::shared_ptr<ICIMParameterDecl> parameter) {
+        std::string const className = parameter->GetReferencedClassName(TCIMContext());
+        std::string const type = NameOf(parameter->GetType(TCIMContext())) + (className.empty() ? "" : " to " + className);
+        parameters += (parameters.empty() ? "" : ", ") + type + " " + parameter->GetName(TCIMContext());
+        return true;
+      },
+      TCIMContext());
+  return NameOf(method.GetReturnType(TCIMContext())) + " " + method.GetName(TCIMContext()) + "(" + parameters + ")";
+}
+
+// Every method, inherited ones too; one that a class declares again is shown as it is declared last.
+std::vector<boost::shared_ptr<ICIMMethodDecl>> MethodsOf(std::vector<boost::shared_ptr<ICIMClass const>> const& lineage) {
+  std::vector<boost::shared_ptr<ICIMMethodDecl>> methods;
+  std::map<std::string, std::size_t> numbers;  // in methods, by name
+  for (auto const& ancestor : lineage)
+    ancestor->EnumerateMethodDecls(
+        [&](boost::shared_ptr<ICIMMethodDecl> method) {
+          auto const [place, isNew] = numbers.emplace(method->GetName(TCIMContext()), methods.size());
+          if (isNew) methods.emplace_back();
+          methods[place->second] = method;
+          return true;
+        },
+        TCIMContext());
+  return methods;
+}
+
+std::string MethodsAsText(std::vector<boost::shared_ptr<ICIMClass const>> const& lineage) {
+  std::string text;
+  for (auto const& method : MethodsOf(lineage))
+    for (std::string const& line : Wrapped(Printable(SignatureOf(*method)), OutputWidth())) text += line + "\n";
+  return text.empty() ? "" : "\nMethods\n" + text;
+}
+
+std::string ClassAsText(TNamespaceView const& view, boost::shared_ptr<ICIMClass const> cls) {
+  auto const lineage = LineageOf(cls);
+  std::string const name = cls->GetName(TCIMContext());
+  std::string heading = view.GetName() + ":" + name;
+  for (std::size_t at = lineage.size() - 1; at-- > 0;) heading += " : " + lineage[at]->GetName(TCIMContext());
+
+  TTable table({24, 10, 5, 35});
+  table.Add({"Property", "Type", "Key", "Default"});
+  ForEachProperty(*cls, lineage, [&](ICIMPropertyDecl const& property) {
+    table.Add({property.GetName(TCIMContext()), NameOf(property.GetType(TCIMContext())),
+               property.IsKey(TCIMContext()) ? "key" : "",
+               TValueWords(property).TextOf(property.GetDefaultValue(TCIMContext()))});
+  });
+
+  std::string text = Heading(heading) + DescriptionOf(*cls) + table.GetText() + ValuesAsText(*cls, lineage) +
+                     MethodsAsText(lineage) + "\nInstances\n";
+  auto const instances = view.InstancesOf(name);
+  for (auto const& instance : instances) text += Printable(view.PathOf(*instance)) + "\n";
+  if (instances.empty()) text += Printable("none: " + view.WhyNoInstance(name).fReason) + "\n";
+  return text;
+}
+
+TJson ValuesAsJson(TValueWords const& words) {
+  TJson values = TJson::array();
+  for (auto const& [entry, word] : words.Entries()) values.push_back({{"value", entry}, {"word", word}});
+  return values;
+}
+
+TJson ClassAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMClass const> cls) {
+  auto const lineage = LineageOf(cls);
+  TJson properties = TJson::object();
+  ForEachProperty(*cls, lineage, [&](ICIMPropertyDecl const& property) {
+    TJson& json = properties[property.GetName(TCIMContext())];
+    json = {{"type", NameOf(property.GetType(TCIMContext()))},
+            {"key", property.IsKey(TCIMContext())},
+            {"default", ValueAsJson(property.GetDefaultValue(TCIMContext()))}};
+    TValueWords const words(property);
+    if (!words.Entries().empty()) json["values"] = ValuesAsJson(words);
+  });
+  TJson methods = TJson::array();
+  for (auto const& method : MethodsOf(lineage)) methods.push_back(SignatureOf(*method));
+  std::string const name = cls->GetName(TCIMContext());
+  TJson instances = TJson::array();
+  for (auto const& instance : view.InstancesOf(name)) instances.push_back(view.PathOf(*instance));
+  auto const superClass = cls->GetSuperClass(TCIMContext());
+  return {{"class", name},
+          {"namespace", view.GetName()},
+          {"provider", view.GetProviderName()},
+          {"superClass", superClass ? TJson(superClass->GetName(TCIMContext())) : TJson(nullptr)},
+          {"properties", properties},
+          {"methods", methods},
+          {"instances", instances}};
+}
+
+// A path names an instance or a class.
+template <class TOfInstance, class TOfClass>
+auto ForElement(boost::shared_ptr<ICIMElement> const& element, TOfInstance ofInstance, TOfClass ofClass) {
+  auto const instance = boost::dynamic_pointer_cast<ICIMInstance const>(element);
+  return instance ? ofInstance(*instance) : ofClass(boost::dynamic_pointer_cast<ICIMClass const>(element));
+}
+
+std::string ElementAsText(TNamespaceView const& view, boost::shared_ptr<ICIMElement> const& element) {
+  return ForElement(
+      element, [&](ICIMInstance const& instance) { return InstanceAsText(view, instance); },
+      [&](boost::shared_ptr<ICIMClass const> cls) { return ClassAsText(view, cls); });
+}
+
+std::string ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElement> const& element) {
+  TJson document = DocumentHead("zep show", kExitComplete, "");
+  document["object"] = ForElement(
+      element, [&](ICIMInstance const& instance) { return InstanceAsJson(view, instance); },
+      [&](boost::shared_ptr<ICIMClass const> cls) { return ClassAsJson(view, cls); });
+  return AsText(document);
+}
+
+struct TSearch {
+  std::string fText;                   // of what was found; empty when nothing was
+  std::vector<std::string> fFailures;  // of the providers
+};
+
+TSearch Search(TArguments const& arguments) {
+  TSearch search;
+  bool const isMof = !arguments.fMofFile.empty();
+  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugIns();
+  search.fFailures = FailuresOf(plugIns);
+  for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
+    std::string const failure = FailureOf([&] {
+      auto const element = Find(view, arguments.fPath);
+      if (element) search.fText = arguments.fAsJson ? ElementAsJson(view, element) : ElementAsText(view, element);
+    });
+    if (!search.fText.empty()) break;
+    if (!failure.empty()) search.fFailures.push_back(view.GetProviderName() + ": " + failure);
+  }
+  return search;
+}
+
+int Show(TArguments const& arguments) {
+  if (arguments.fSample) SelectSample();
+  TSearch search = Search(arguments);
+  if (!search.fText.empty()) {
+    WriteOutput(search.fText);
+    return kExitComplete;
+  }
+  std::vector<std::string>& reasons = search.fFailures;
+  reasons.push_back((arguments.fMofFile.empty() ? "no provider has the" : arguments.fMofFile + " has no") + " object \"" +
+                    arguments.fPath + "\"");
+  if (arguments.fAsJson) WriteOutput(FailureAsJson("zep show", kExitNothing, Joined(reasons, "; ")));
+  for (std::string const& reason : reasons) std::cerr << "zep: " << Printable(reason) << "\n";
+  return kExitNothing;
+}
+
+}  // namespace
+
+TRun AddShowArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  command
+      .add_option("path", arguments->fPath,
+                  "A class, such as CIM_Chassis, or the path of an object as zep report --json prints it")
+      ->required();
+  command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  auto* const mof = command.add_option("--mof", arguments->fMofFile, "Show what this MOF file declares, not what providers have");
+  command.add_flag("--sample", arguments->fSample, "Show objects of the bundled table of an invented server, labelled SAMPLE")
+      ->excludes(mof);
+  command.footer("Exit status: 0 when there is such an object, 1 when there is none, 64 for wrong usage.");
+  return [arguments] { return Show(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,234 @@
+// zep wpad: the address of the proxy configuration file, as the DHCP server of the local network names it.
+
+#include "AutoProxyDiscovery.h"
+#include "TOSSpecific.h"
+#include "tools/zep/commands/Commands.h"
+#include "tools/zep/output/ExitStatus.h"
+#include "tools/zep/output/Json.h"
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/Terminal.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/wpad/DhcpClients.h"
+#include "tools/zep/wpad/PacFile.h"
+#include "tools/zep/wpad/ProxySearch.h"
+
+#include <CLI/CLI.hpp>
+
+#include <algorithm>
+#include <iostream>
+#include <memory>
+#include <optional>
+#include <sstream>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  bool fAsJson = false;
+  bool fIsConfirmed = false;
+  bool fKeepsClients = false;
+  bool fFetches = false;
+};
+
+struct TFindings {
+  TSearch fSearch;
+  bool fStoppedClients = false;
+  std::optional<TPacFile> fPacFile;  // when it was asked for and there is a URL
+
+  bool IsComplete() const { return !fSearch.fUrl.empty() && (!fPacFile || fPacFile->fFailure.empty()); }
+  EExitStatus ExitStatus() const { return fSearch.fUrl.empty() ? kExitNothing : IsComplete() ? kExitComplete : kExitPartial; }
+};
+
+// ---- Before the start ----
+
+std::vector<std::string> LinesOf(std::string const& text) {
+  std::vector<std::string> lines;
+  std::istringstream stream(text);
+  for (std::string line; std::getline(stream, line);) lines.push_back(line);
+  return lines;
+}
+
+void TellWhatWillHappen(std::vector<std::string> const& clients) {
+  std::cerr << "This ends the DHCP clients of this machine: every process with \"dhclient\" in its line of \"ps -e\".\n";
+  for (std::string const& line : clients) std::cerr << "  " << Printable(line) << "\n";
+  if (clients.empty()) std::cerr << "  (none runs now)\n";
+}
+
+bool IsConfirmed() {
+  std::cerr << "Go on? [y/N] " << std::flush;
+  std::string answer;
+  std::getline(std::cin, answer);
+  return answer == "y" || answer == "Y" || answer == "yes";
+}
+
+// ---- The countdown ----
+
+// On a terminal only, on standard error, and wiped away at the end.
+class TCountdown {
+public:
+  ~TCountdown() {
+    if (fWidth > 0) std::cerr << '\r' << std::string(fWidth, ' ') << '\r' << std::flush;
+  }
+  void Show(TAsking const& asking, int secondsLeft) {
+    if (!CanRedrawErrors()) return;
+    std::string text = "Waiting for an answer to " + asking.fAddress + ": " + std::to_string(secondsLeft) + " s left";
+    text.resize(std::max(text.size(), fWidth), ' ');
+    fWidth = text.size();
+    std::cerr << '\r' << text << std::flush;
+  }
+
+private:
+  std::size_t fWidth = 0;
+};
+
+// ---- Output ----
+
+std::string NameOf(TAsking const& asking) {
+  if (asking.fInterface.empty()) return "IPv6";
+  return asking.fInterface + (asking.fIsUp ? "" : ", down") + (asking.fIsPromiscuous ? ", promiscuous" : "");
+}
+
+std::string WhatCameBack(TAsking const& asking) {
+  if (asking.fReply) {
+    TReply const& reply = *asking.fReply;
+    return std::to_string(reply.fSize) + " bytes from " + reply.fSender + " after " + std::to_string(reply.fMilliseconds) +
+           " ms, " + (asking.fUrl.empty() ? "without a URL" : "with the URL");
+  }
+  return asking.fFailure.empty() ? "nothing within " + std::to_string(kReplySeconds * asking.fSent) + " s" : asking.fFailure;
+}
+
+std::string WhatWasSent(TAsking const& asking) {
+  if (asking.fSent == 0) return "nothing";
+  return std::to_string(asking.fSent) + " x " + std::to_string(AutoProxyDiscovery::kMessageSize) + " bytes";
+}
+
+// A file of whoever serves it, for a terminal.
+std::string PrintableLines(std::string const& text) {
+  std::string printable;
+  for (std::string line : LinesOf(text)) {
+    if (!line.empty() && line.back() == '\r') line.pop_back();
+    for (std::size_t tab; (tab = line.find('\t')) != std::string::npos;) line.replace(tab, 1, "    ");
+    printable += Printable(line) + "\n";
+  }
+  return printable;
+}
+
+std::string AsText(TFindings const& findings) {
+  std::string text;
+  if (!findings.fSearch.fUrl.empty()) text += Printable(findings.fSearch.fUrl) + "\n";
+  if (!findings.fSearch.fAskings.empty()) {
+    TTable table({16, 16, 14, 28});
+    table.Add({"Interface", "Address", "Sent", "Came back"});
+    for (TAsking const& asking : findings.fSearch.fAskings)
+      table.Add({NameOf(asking), asking.fAddress, WhatWasSent(asking), WhatCameBack(asking)});
+    text += (text.empty() ? "" : "\n") + table.GetText();
+  }
+  if (findings.fPacFile && findings.fPacFile->fFailure.empty()) text += "\n" + PrintableLines(findings.fPacFile->fText);
+  return text;
+}
+
+// Empty when nothing is.
+std::string WhatIsMissing(TFindings const& findings) {
+  if (findings.fPacFile && !findings.fPacFile->fFailure.empty())
+    return "the file was not fetched: " + findings.fPacFile->fFailure;
+  if (!findings.fSearch.fUrl.empty()) return "";
+  if (findings.fSearch.fAskings.empty()) return "no interface has a name that begins with \"eth\"";
+  return findings.fSearch.fFailure.empty() ? "nobody named a proxy configuration file" : findings.fSearch.fFailure;
+}
+
+TJson AskingAsJson(TAsking const& asking) {
+  TJson json = {{"interface", OrNull(asking.fInterface)}};
+  json["up"] = asking.fInterface.empty() ? TJson(nullptr) : TJson(asking.fIsUp);
+  json["promiscuous"] = asking.fInterface.empty() ? TJson(nullptr) : TJson(asking.fIsPromiscuous);
+  json["address"] = OrNull(asking.fAddress);
+  json["hardwareAddress"] = OrNull(asking.fHardwareAddress);
+  json["sent"] = asking.fSent;
+  json["reply"] = nullptr;
+  if (asking.fReply)
+    json["reply"] = {{"bytes", asking.fReply->fSize},
+                     {"from", asking.fReply->fSender},
+                     {"milliseconds", asking.fReply->fMilliseconds},
+                     {"url", OrNull(asking.fUrl)}};
+  json["failure"] = OrNull(asking.fFailure);
+  return json;
+}
+
+std::string AsJson(TFindings const& findings) {
+  TJson document = DocumentHead("zep wpad", findings.ExitStatus(), WhatIsMissing(findings));
+  document["status"] = NameOf(findings.ExitStatus());
+  document["url"] = OrNull(findings.fSearch.fUrl);
+  document["stoppedClients"] = findings.fStoppedClients;
+  document["messageBytes"] = AutoProxyDiscovery::kMessageSize;
+  document["interfaces"] = TJson::array();
+  for (TAsking const& asking : findings.fSearch.fAskings) document["interfaces"].push_back(AskingAsJson(asking));
+  document["failure"] = OrNull(findings.fSearch.fFailure);
+  if (findings.fPacFile) {
+    bool const isThere = findings.fPacFile->fFailure.empty();
+    document["file"] = {{"text", isThere ? TJson(findings.fPacFile->fText) : TJson(nullptr)},
+                        {"failure", OrNull(findings.fPacFile->fFailure)}};
+  }
+  return zep::AsText(document);
+}
+
+// ---- The steps ----
+
+// False, with the clients left alone, when the user does not want it. Throws std::runtime_error when a process that is not a DHCP
+// client would be ended: the library reads the same list again for itself.
+bool StopClients(bool isConfirmed) {
+  std::vector<std::string> const clients = DhcpClientLines();
+  TellWhatWillHappen(clients);
+  std::string const why = WhyNotToBeEnded(clients);
+  if (!why.empty()) throw std::runtime_error(why);
+  if (!isConfirmed && !IsConfirmed()) return false;
+  // Again: the answer may have taken its time.
+  std::string const whyNow = WhyNotToBeEnded(DhcpClientLines());
+  if (!whyNow.empty()) throw std::runtime_error(whyNow);
+  AutoProxyDiscovery::wpadPreconfig();
+  return true;
+}
+
+TSearch Search() {
+  if (IsPortTaken()) std::cerr << "zep: another program holds port 68; trying again for up to 30 s\n";
+  TCountdown countdown;
+  return SearchProxy([&](TAsking const& asking, int secondsLeft) { countdown.Show(asking, secondsLeft); });
+}
+
+void Tell(TFindings const& findings, bool asJson) {
+  WriteOutput(asJson ? AsJson(findings) : AsText(findings));
+  std::string const missing = WhatIsMissing(findings);
+  if (!missing.empty()) std::cerr << "zep: " << Printable(missing) << "\n";
+}
+
+int Wpad(TArguments const& arguments) {
+  std::string const whyNot = WhyNoListening();
+  if (!whyNot.empty()) throw std::runtime_error(whyNot);
+  if (!arguments.fKeepsClients && !StopClients(arguments.fIsConfirmed))
+    throw std::runtime_error("nothing was done; --yes confirms, and --no-stop leaves the DHCP clients alone");
+  TFindings findings{Search(), !arguments.fKeepsClients, {}};
+  std::string const& url = findings.fSearch.fUrl;
+  if (arguments.fFetches && !url.empty()) findings.fPacFile = FetchPacFile(url);
+  Tell(findings, arguments.fAsJson);
+  return findings.ExitStatus();
+}
+
+}  // namespace
+
+TRun AddWpadArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  command.add_flag("--fetch", arguments->fFetches, "Fetch the file too, through plain HTTP by libcurl, and print it");
+  auto* const yes = command.add_flag("--yes", arguments->fIsConfirmed, "End the DHCP clients without asking");
+  command
+      .add_flag("--no-stop", arguments->fKeepsClients, "Leave the DHCP clients alone; while one holds port 68, nothing is heard")
+      ->excludes(yes);
+  command.footer(
+      "Asks the DHCP server, by a broadcast about each interface whose name begins with \"eth\", for the address of the\n"
+      "proxy configuration file (option 252), and prints it. Only root may listen for the answer, and only one program\n"
+      "of a machine: the running DHCP clients are ended first. An interface without an answer takes 18 s.\n"
+      "Exit status: 0 when there is an address (and the file, if asked for), 2 without the file, 1 when there is none,\n"
+      "64 for wrong usage.");
+  return [arguments] { return Wpad(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,146 @@
+#include "tools/zep/controller/Controller.h"
+
+#include "IIPMILan.h"
+#include "TOSSpecific.h"
+#include "tools/zep/controller/ControllerSession.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/secrets/Secrets.h"
+
+#include <arpa/inet.h>
+
+#include <algorithm>
+#include <cctype>
+#include <chrono>
+#include <cstdio>
+#include <vector>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+using TClock = std::chrono::steady_clock;
+
+constexpr char kEnd = '\0';  // of each field in what a process says
+
+// One part of the identity, as the controller's FRU data hold it.
+class TField {
+public:
+  // The text counts up to its first zero byte.
+  TField(char const* name, std::string const& text) : fName(name), fText(text.substr(0, text.find('\0'))) {}
+
+  std::string GetName() const { return fName; }
+
+  // Memory that was never written holds 0xFF everywhere.
+  bool IsNotProgrammed() const { return !fText.empty() && fText.find_first_not_of('\xff') == std::string::npos; }
+  bool IsTold() const { return !GetValue().empty() && fText != "N/A"; }
+
+  // Without the blanks and the unwritten memory at its end.
+  std::string GetValue() const { return fText.substr(0, fText.find_last_not_of(" \xff") + 1); }
+
+private:
+  char const* fName;
+  std::string fText;
+};
+
+// Why not all of the fields are told; empty when all are.
+std::string WhyNotAll(std::vector<TField> const& fields) {
+  std::string notProgrammed;
+  bool isOtherMissing = false;
+  for (TField const& field : fields) {
+    if (field.IsNotProgrammed()) notProgrammed += (notProgrammed.empty() ? "" : ", ") + field.GetName();
+    isOtherMissing = isOtherMissing || (!field.IsTold() && !field.IsNotProgrammed());
+  }
+  if (notProgrammed.empty()) return isOtherMissing ? "the controller did not tell everything" : "";
+  return "not programmed in the controller's FRU data (0xFF): " + notProgrammed +
+         (isOtherMissing ? "; the controller did not tell the rest" : "");
+}
+
+std::string WithoutASession(TClock::time_point start, std::string const& why) {
+  char seconds[32];
+  std::snprintf(seconds, sizeof seconds, "%.1f s", std::chrono::duration<double>(TClock::now() - start).count());
+  return std::string(3, kEnd) + "no session with its controller after " + seconds + ": " + why + kEnd;
+}
+
+std::string TakeField(std::string& said) {
+  std::size_t const end = said.find(kEnd);
+  std::string field = said.substr(0, end);
+  said.erase(0, end == said.npos ? end : end + 1);
+  return field;
+}
+
+std::string OrUnknown(std::string const& field) { return field.empty() ? "unknown" : field; }
+
+}  // namespace
+
+bool IsHostName(std::string const& host) {
+  auto const isOfName = [](unsigned char c) { return std::isalnum(c) != 0 || c == '-' || c == '.' || c == '_'; };
+  if (!host.empty() && std::all_of(host.begin(), host.end(), isOfName)) return true;
+  std::size_t const zone = host.find('%');  // "fe80::1%eth0"
+  bool const isZone =
+      zone == host.npos ||
+      (zone + 1 < host.size() && std::all_of(host.begin() + static_cast<std::ptrdiff_t>(zone) + 1, host.end(), isOfName));
+  in6_addr address;
+  return isZone && ::inet_pton(AF_INET6, host.substr(0, zone).c_str(), &address) == 1;
+}
+
+std::string AskController(std::string const& host, TAccount const& account) {
+  if (!IsHostName(host)) return std::string(3, kEnd) + kNoHostName + kEnd;
+  auto const start = TClock::now();
+  std::string const why = WhyNoSession(host, account);
+  if (!why.empty()) return WithoutASession(start, why);
+  std::string const password = account.fPassword.ForLibrary();
+  std::string const answer = TOSSpecific::GetRemoteMT(host, account.fUser, password);
+  if (answer.empty()) return WithoutASession(start, "it gave one, but not a second time");
+  std::vector<TField> const fields = {
+      {"machine type", answer},
+      {"model", TOSSpecific::GetRemoteMachineModel(host, account.fUser, password)},
+      {"serial number", TOSSpecific::GetRemoteMSN(host, account.fUser, password)},
+  };
+  IIPMILan::GetInstance()->IpmilanCloseConnect();
+
+  std::string said;
+  for (TField const& field : fields) said += (field.IsTold() ? field.GetValue() : "") + kEnd;
+  return said + WhyNotAll(fields) + kEnd;
+}
+
+TRemoteIdentity IdentityFrom(std::string const& host, std::string const& said, bool isComplete) {
+  TRemoteIdentity identity;
+  identity.fHost = host;
+  std::string rest = isComplete ? said : "";
+  for (std::string* field : {&identity.fType, &identity.fModel, &identity.fSerialNumber, &identity.fError})
+    *field = TakeField(rest);
+  if (!isComplete) identity.fError = "the process that asked its controller did not come to its end";
+  return identity;
+}
+
+bool IsComplete(TRemoteIdentity const& identity) { return identity.fError.empty(); }
+
+bool IsNothing(TRemoteIdentity const& identity) {
+  return identity.fType.empty() && identity.fModel.empty() && identity.fSerialNumber.empty();
+}
+
+EExitStatus StatusOf(TRemoteIdentity const& identity) {
+  if (IsComplete(identity)) return kExitComplete;
+  return IsNothing(identity) ? kExitNothing : kExitPartial;
+}
+
+TJson AsJson(TRemoteIdentity const& identity) {
+  TJson document = DocumentHead("zep remote", StatusOf(identity), identity.fError);
+  document["host"] = identity.fHost;
+  document["type"] = OrNull(identity.fType);
+  document["model"] = OrNull(identity.fModel);
+  document["serialNumber"] = OrNull(identity.fSerialNumber);
+  if (!identity.fError.empty()) document["error"] = identity.fError;  // the reason, under the name that it had first
+  return document;
+}
+
+std::string AsText(TRemoteIdentity const& identity) {
+  TTable table({15, 61});
+  table.Add({"Remote server", MessageWithoutSecrets(identity.fHost)});
+  table.Add({"Machine type", OrUnknown(identity.fType)});
+  table.Add({"Model", OrUnknown(identity.fModel)});
+  table.Add({"Serial number", OrUnknown(identity.fSerialNumber)});
+  return table.GetText();
+}
+
+}  // namespace NQRVZEP20::zep

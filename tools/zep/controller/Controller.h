@@ -1,0 +1,45 @@
+#pragma once
+
+#include "tools/zep/output/Json.h"
+#include "tools/zep/secrets/TSecret.h"
+
+#include <string>
+
+namespace NQRVZEP20::zep {
+
+struct TAccount {
+  std::string fUser;
+  TSecret fPassword;
+};
+
+// What a remote server's controller tells of it.
+struct TRemoteIdentity {
+  std::string fHost;
+  std::string fType, fModel, fSerialNumber;  // empty: not told
+  std::string fError;                        // why something was not told; empty when all was
+};
+
+// Whether it may be the name or the address of a host: of letters, digits, "-", "." and "_", or an IPv6 address. Neither
+// "user:secret@host" nor "host secret" is one.
+bool IsHostName(std::string const& host);
+constexpr char const* kNoHostName =
+    "not a host name or an address; the account is named by --user, and its password is in --password-file or ZEP_BMC_PASSWORD";
+
+// Asks the controller; to be called in a process of its own. What is not a host name is not asked. The result is for
+// IdentityFrom.
+std::string AskController(std::string const& host, TAccount const& account);
+
+// Puts together what the process said. `isComplete` is false when it did not come to its end.
+TRemoteIdentity IdentityFrom(std::string const& host, std::string const& said, bool isComplete);
+
+bool IsComplete(TRemoteIdentity const& identity);
+bool IsNothing(TRemoteIdentity const& identity);
+
+// What zep ends with when it asks for this one alone.
+EExitStatus StatusOf(TRemoteIdentity const& identity);
+
+// A document of "zep remote".
+TJson AsJson(TRemoteIdentity const& identity);
+std::string AsText(TRemoteIdentity const& identity);
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,180 @@
+#include "tools/zep/media/TMountedMedium.h"
+
+#include "TOSSpecific.h"
+#include "TZEPException.h"
+#include "tools/zep/media/Drives.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/processes/Descriptor.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <cstdlib>
+#include <sstream>
+#include <stdexcept>
+#include <system_error>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+TDescriptor Open(int directory, std::string const& name, int flags) {
+  return TDescriptor(::openat(directory, name.c_str(), flags | O_CLOEXEC, 0644));
+}
+
+[[noreturn]] void Throw(std::string const& what) { throw std::runtime_error(what); }
+
+void ThrowIf(bool hasFailed, std::string const& what) {
+  if (hasFailed) throw std::runtime_error(what + ": " + std::generic_category().message(errno));
+}
+
+// ---- Mounting ----
+
+std::string MountPointOf(std::string const& device) {
+  bool const isFloppy = device == "/dev/floppy" || device == "/dev/fd0" || device == "/dev/fd1";
+  return isFloppy ? "/mnt/floppy" : "/mnt/key";
+}
+
+// What the library tries to mount when the device itself cannot be mounted.
+std::string FirstPartitionOf(std::string const& device) { return device + "1"; }
+
+// Some file systems mount under numbers of their own.
+bool IsMountOf(std::string const& node, TMount const& mount) {
+  std::uint64_t const number = NumberOf(node);
+  return number != 0 && (number == mount.fDevice || number == NumberOf(mount.fSource));
+}
+
+// Whether the mount is that of the device, or of its first partition.
+bool IsOf(TMount const& mount, std::string const& device) {
+  std::string const partition = FirstPartitionOf(device);
+  return IsMountOf(device, mount) || (IsMountOf(partition, mount) && IsPartitionOf(partition, device));
+}
+
+void RefuseOther(std::optional<TMount> const& mount, std::string const& mountPoint, std::string const& device) {
+  if (mount && !IsOf(*mount, device)) Throw(mountPoint + " holds " + mount->fSource + "; unmount that first");
+}
+
+// "/dev/sdb11" is no first partition of "/dev/sdb1".
+void RefuseStranger(std::string const& device) {
+  std::string const next = FirstPartitionOf(device);
+  if (NumberOf(next) != 0 && !IsPartitionOf(next, device))
+    Throw(device + " is not mounted: " + next + ", which would be tried as well, is not a partition of it");
+}
+
+// The library runs it by the shell, and takes its absence for a medium that cannot be read.
+void NeedProgram(std::string const& name) {
+  char const* const path = std::getenv("PATH");
+  std::istringstream directories(path != nullptr ? path : "");
+  for (std::string directory; std::getline(directories, directory, ':');)
+    if (::access((directory + "/" + name).c_str(), X_OK) == 0) return;
+  Throw("the program " + name + " is missing; install the package mount");
+}
+
+TMount MountOrThrow(std::string const& device, std::string const& mountPoint) {
+  std::optional<TMount> const present = MountAt(mountPoint);
+  RefuseOther(present, mountPoint, device);
+  if (!present) RefuseStranger(device);
+  if (!TOSSpecific::IsAdmin()) Throw("only root can mount " + device);
+  NeedProgram("mount");
+  try {
+    if (!TOSSpecific::DirExists(mountPoint)) TOSSpecific::CreateDir(mountPoint);
+  } catch (TZEPException const& failure) {
+    Throw("the directory " + mountPoint + " cannot be made: " + failure.what());
+  }
+  try {
+    TOSSpecific::MountDevice(device);
+  } catch (TZEPException const&) {
+    Throw(device + " cannot be mounted: neither it nor " + FirstPartitionOf(device) + " has a file system that can be read");
+  }
+  std::optional<TMount> const mount = MountAt(mountPoint);
+  if (!mount) Throw(device + " was not mounted: a mount point whose name ends in " + mountPoint + " is in the way");
+  RefuseOther(mount, mountPoint, device);
+  return *mount;
+}
+
+// Where media are mounted; nothing else is to be unmounted by a slip of the fingers.
+void CheckDirectory(std::string const& directory) {
+  auto const isBelow = [&](char const* place) { return directory.rfind(place, 0) == 0; };
+  if (IsPlainPath(directory) && (isBelow("/mnt/") || isBelow("/media/") || isBelow("/run/media/"))) return;
+  throw TWrongUsage("\"" + directory +
+                    "\" is not a mount point of a medium: below /mnt, /media or /run/media, of letters, digits, " +
+                    "\"/\", \"-\", \"_\" and \".\"");
+}
+
+// ---- Writing ----
+
+// To a name that nothing has yet. Some file systems in user space cannot see to that by themselves.
+void RenameToNew(int directory, std::string const& from, std::string const& to, std::string const& what) {
+  if (::renameat2(directory, from.c_str(), directory, to.c_str(), RENAME_NOREPLACE) == 0) return;
+  ThrowIf(errno != EINVAL && errno != ENOSYS, what);
+  if (::faccessat(directory, to.c_str(), F_OK, AT_SYMLINK_NOFOLLOW) == 0) errno = EEXIST;
+  ThrowIf(errno != ENOENT || ::renameat(directory, from.c_str(), directory, to.c_str()) != 0, what);
+}
+
+// Some file systems cannot be asked to sync a directory; syncing the whole of them then has to do.
+void SyncDirectory(int directory, std::string const& what) {
+  ThrowIf(::fsync(directory) != 0 && errno != EINVAL, what);
+  ThrowIf(::syncfs(directory) != 0, what);
+}
+
+}  // namespace
+
+TMountedMedium::TMountedMedium(std::string const& device) {
+  CheckDevice(device);
+  fMountPoint = MountPointOf(device);
+  fMount = MountOrThrow(device, fMountPoint);
+}
+
+void TMountedMedium::Write(std::string const& name, std::string const& contents) const {
+  std::string const what = name + " cannot be written on " + Device();
+  if (fMount.fIsReadOnly) Throw(what + ": the medium is read-only");
+  TDescriptor const directory = Open(AT_FDCWD, fMountPoint, O_RDONLY | O_DIRECTORY);
+  ThrowIf(!directory, what);
+
+  // Under another name at first, so that a medium that is pulled out never bears half a file under this one.
+  std::string const draft = name + ".part";
+  std::string present = draft;
+  TDescriptor const file = Open(directory.Get(), draft, O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW);
+  ThrowIf(!file, what);
+  try {
+    ThrowIf(!WriteWhole(file.Get(), contents), what);
+    ThrowIf(::fsync(file.Get()) != 0, what);
+    RenameToNew(directory.Get(), draft, name, what);
+    present = name;
+    SyncDirectory(directory.Get(), what);
+  } catch (std::runtime_error const&) {
+    ::unlinkat(directory.Get(), present.c_str(), 0);
+    throw;
+  }
+}
+
+std::vector<std::string> UnmountDirectory(std::string const& directory) {
+  CheckDirectory(directory);
+  std::optional<TMount> const mount = MountAt(directory);
+  if (!mount) Throw("nothing is mounted at " + directory);
+  if (!TOSSpecific::IsAdmin()) Throw("only root can unmount " + directory);
+  NeedProgram("umount");
+
+  TDrives const drives = DrivesOf(*mount);
+  // Opened before: it then tells of what could not be written while unmounting.
+  TDescriptor const source = Open(AT_FDCWD, mount->fSource, O_RDONLY | O_NONBLOCK);
+  try {
+    TOSSpecific::UnmountDevice(mount->fSource, directory);
+  } catch (TZEPException const&) {
+    Throw(directory + " cannot be unmounted: something still uses it");
+  }
+  if (source) ThrowIf(::fsync(source.Get()) != 0, mount->fSource + " is unmounted, but was not written to its end");
+  return MountPointsOf(drives);
+}
+
+std::string WhetherToTakeOut(std::vector<std::string> const& stillMountedAt) {
+  if (stillMountedAt.empty()) return "can be taken out";
+  std::string text = "is still mounted at";
+  for (std::string const& mountPoint : stillMountedAt) text += " " + Printable(mountPoint);
+  return text;
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,36 @@
+#pragma once
+
+#include "tools/zep/media/Media.h"
+
+#include <string>
+
+namespace NQRVZEP20::zep {
+
+// A medium that the library has mounted. Everything throws std::runtime_error with the reason, TWrongUsage for a name.
+class TMountedMedium {
+public:
+  // Mounts the device at the library's mount point for it, which is made when it is missing. One that is mounted there
+  // already will do; another one there is an error.
+  explicit TMountedMedium(std::string const& device);
+
+  std::string const& Device() const { return fMount.fSource; }  // what is mounted: the device or its first partition
+  std::string const& MountPoint() const { return fMountPoint; }
+
+  // Writes a file into the topmost directory. When it returns, the file is on the medium, whole. When it throws, there is no
+  // file of that name, unless there was one before.
+  void Write(std::string const& name, std::string const& contents) const;
+
+private:
+  std::string fMountPoint;
+  TMount fMount;
+};
+
+// Unmounts what is mounted at a directory below /mnt, /media or /run/media (TWrongUsage for any other). When it returns,
+// everything is on the medium. The result is where the medium, or another partition of it, is mounted still: none when it
+// can be taken out.
+std::vector<std::string> UnmountDirectory(std::string const& directory);
+
+// "can be taken out", or "is still mounted at /media/a".
+std::string WhetherToTakeOut(std::vector<std::string> const& stillMountedAt);
+
+}  // namespace NQRVZEP20::zep

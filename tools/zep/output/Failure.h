@@ -1,0 +1,42 @@
+#pragma once
+
+#include "tools/zep/output/ExitStatus.h"
+
+#include <exception>
+#include <stdexcept>
+#include <string>
+
+namespace NQRVZEP20::zep {
+
+// Ends zep with that status. The text gives the cause and, where there is one, the remedy, and shows no password.
+struct TFailure : std::runtime_error {
+  TFailure(EExitStatus status, std::string const& why) : std::runtime_error(why), fStatus(status) {}
+
+  EExitStatus fStatus;
+};
+
+// zep was called in a way that it does not know.
+struct TWrongUsage : TFailure {
+  explicit TWrongUsage(std::string const& why) : TFailure(kExitUsage, why) {}
+};
+
+// The exit status for what was thrown: a TFailure's own, kExitNothing for all else.
+inline EExitStatus StatusOf(std::exception const& thrown) {
+  auto const* const failure = dynamic_cast<TFailure const*>(&thrown);
+  return failure != nullptr ? failure->fStatus : kExitNothing;
+}
+
+// Runs what a plug-in has a part in, and returns why it failed, or an empty text. A plug-in may throw anything.
+template <class TWork>
+std::string FailureOf(TWork work) {
+  try {
+    work();
+    return "";
+  } catch (std::exception const& failure) {
+    return failure.what();
+  } catch (...) {
+    return "it threw something that is no exception of the standard library";
+  }
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,49 @@
+#pragma once
+
+#include "TCIMValue.h"
+#include "tools/zep/TNamespaceView.h"
+#include "tools/zep/output/ExitStatus.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Output.h"
+
+#include <nlohmann/json.hpp>
+
+#include <exception>
+#include <string>
+
+namespace NQRVZEP20::zep {
+
+using TJson = nlohmann::ordered_json;
+
+// The version of the documents that zep prints. It grows when a program that reads them would notice.
+constexpr int kDocumentVersion = 2;
+
+// The head that every document has: what it is, its version, whether it is about the sample, what zep ends with, and why that
+// is not kExitComplete. The reason is empty for kExitComplete, and for nothing else.
+TJson DocumentHead(std::string const& what, EExitStatus status, std::string const& reason);
+
+// A document as text, in lines for people or in one line. Bytes that are not UTF-8 become the replacement character. Members that
+// hold a message, such as "reason", or repeat an argument, such as "url", hide passwords (Secrets.h); all others are data.
+std::string AsText(TJson const& document);
+std::string AsLine(TJson const& document);
+
+// The same as AsText, with the messages verbatim too: for a document that is sent or stored.
+std::string AsVerbatimText(TJson const& document);
+
+// The text; null for an empty one.
+TJson OrNull(std::string const& text);
+
+// The document of a command that failed before it had one of its own: the head alone, in one line.
+std::string FailureAsJson(std::string const& what, EExitStatus status, std::string const& reason);
+
+// Booleans and numbers become their JSON kinds, arrays arrays, NULL null, and all others their text. So do integers of 64 bits,
+// which many programs read as reals of 53 bits, and a real that is not finite.
+TJson ValueAsJson(TCIMValue const& value);
+
+// The type's name, with "[]" behind it for an array.
+std::string NameOf(TCIMValue::TCIMType type);
+
+// An instance with its path and all properties: type, value, source, and why there is no value.
+TJson InstanceAsJson(TNamespaceView const& view, ICIMInstance const& instance);
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,69 @@
+#include "tools/zep/Report.h"
+#include "tools/zep/Sample.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/secrets/Secrets.h"
+
+#include <cstdio>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+std::string Title(std::string const& title) { return IsSampleSelected() ? std::string(kSampleLabel) + " " + title : title; }
+
+std::string ValueOf(TAnswer const& answer) {
+  if (answer.fIsKnown) return answer.fValue + (answer.fNote.empty() ? "" : " (" + answer.fNote + ")");
+  return (answer.IsNotApplicable() ? "none: " : "unknown: ") + MessageWithoutSecrets(answer.fMissing.fReason);
+}
+
+std::string RowsAsText(std::string const& title, std::vector<TReportRow> const& rows) {
+  TTable table({15, 36, 25});
+  table.Add({Title(title), "Value", "Source"});
+  for (TReportRow const& row : rows) {
+    TAnswer const& answer = row.fAnswer;
+    table.Add({row.fLabel, ValueOf(answer), answer.fSource.empty() ? "none" : answer.fSource});
+  }
+  return table.GetText();
+}
+
+std::string AsMilliseconds(double milliseconds) {
+  char text[32];
+  std::snprintf(text, sizeof text, "%.1f ms", milliseconds);
+  return text;
+}
+
+std::string WhatHappened(TPlugIn const& plugIn) {
+  if (!plugIn.fError.empty()) return "failed: " + MessageWithoutSecrets(plugIn.fError);
+  if (plugIn.fProviders.empty()) return "loaded, but registered no provider of its own";
+  std::string text;
+  for (TProviderRun const& provider : plugIn.fProviders) {
+    if (!text.empty()) text += "; ";
+    text += provider.fError.empty() ? "filled " + provider.fView->GetName()
+                                    : "provider " + provider.fName + " failed: " + MessageWithoutSecrets(provider.fError);
+  }
+  return text;
+}
+
+std::string PlugInsAsText(std::vector<TPlugIn> const& plugIns) {
+  TTable table({15, 10, 51});
+  table.Add({Title("Plug-in"), "Time", "Result"});
+  for (TPlugIn const& plugIn : plugIns) {
+    double milliseconds = plugIn.fMilliseconds;
+    for (TProviderRun const& provider : plugIn.fProviders) milliseconds += provider.fMilliseconds;
+    table.Add({plugIn.fName, AsMilliseconds(milliseconds), WhatHappened(plugIn)});
+  }
+  if (plugIns.empty()) table.Add({"none", "0.0 ms", "no file lib*.nsp.so in " + PlugInDirectory()});
+  return table.GetText();
+}
+
+}  // namespace
+
+std::string ReportAsText(TReport const& report) {
+  std::string text;
+  for (std::string const& line : report.fHead) text += Printable(line) + "\n";
+  if (!TableFile().empty()) text += Printable("SMBIOS tables read from the file " + TableFile() + " (ZEP_SMBIOS_TABLE)") + "\n";
+  return text + "\n" + RowsAsText("Identity", report.fIdentity) + "\n" + RowsAsText("Details", report.fDetails) + "\n" +
+         PlugInsAsText(report.fPlugIns);
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,231 @@
+#include "tools/zep/output/Text.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstdio>
+#include <iterator>
+#include <numeric>
+#include <optional>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TCharacter {
+  std::uint32_t code;
+  std::size_t size;  // in bytes; 0 for a byte that begins no UTF-8 character
+};
+
+// The character that the text, which is not empty, begins with.
+TCharacter FirstOf(std::string_view text) {
+  auto const byte = [&](std::size_t at) { return static_cast<unsigned char>(text[at]); };
+  if (byte(0) < 0x80) return {byte(0), 1};
+  std::size_t const size = byte(0) >= 0xf0 ? 4 : byte(0) >= 0xe0 ? 3 : 2;
+  if (byte(0) < 0xc2 || byte(0) > 0xf4 || text.size() < size) return {byte(0), 0};
+
+  std::uint32_t code = byte(0) & (0xff >> (size + 1));
+  for (std::size_t at = 1; at < size; ++at) {
+    if ((byte(at) & 0xc0) != 0x80) return {byte(0), 0};
+    code = code << 6 | (byte(at) & 0x3f);
+  }
+  constexpr std::uint32_t smallest[] = {0, 0, 0x80, 0x800, 0x10000};
+  bool const isSurrogate = code >= 0xd800 && code <= 0xdfff;
+  if (code < smallest[size] || code > 0x10ffff || isSurrogate) return {byte(0), 0};
+  return {code, size};
+}
+
+// Characters that a terminal acts upon, or that show text other than it is.
+bool IsHarmful(std::uint32_t code) {
+  bool const isControl = code < 0x20 || (code >= 0x7f && code < 0xa0);
+  bool const isDirection = code == 0x061c || (code >= 0x200b && code <= 0x200f) || (code >= 0x2028 && code <= 0x202e) ||
+                           (code >= 0x2060 && code <= 0x206f) || code == 0xfeff;
+  return isControl || isDirection;
+}
+
+std::string Escaped(std::uint32_t code) {
+  char text[12];
+  std::snprintf(text, sizeof text, code < 0x100 ? "\\x%02x" : "\\u%04x", static_cast<unsigned>(code));
+  return text;
+}
+
+// The text with those of its characters escaped that `isToBeEscaped`.
+template <class TIsToBeEscaped>
+std::string WithEscaped(std::string_view text, TIsToBeEscaped isToBeEscaped) {
+  std::string escaped;
+  escaped.reserve(4 * text.size());  // "\\xff"; a secret leaves no piece elsewhere
+  while (!text.empty()) {
+    TCharacter const first = FirstOf(text);
+    std::size_t const size = std::max<std::size_t>(first.size, 1);
+    if (isToBeEscaped(first))
+      escaped += Escaped(first.code);
+    else
+      escaped += text.substr(0, size);
+    text.remove_prefix(size);
+  }
+  return escaped;
+}
+
+std::string WithoutTrailingBlanks(std::string_view text) { return std::string(text.substr(0, text.find_last_not_of(' ') + 1)); }
+
+// Looks at no more of the text than it has to.
+bool IsWiderThan(std::string_view text, std::size_t width) {
+  std::size_t characters = 0;
+  for (char const c : text)
+    if ((static_cast<unsigned char>(c) & 0xc0) != 0x80 && ++characters > width) return true;
+  return false;
+}
+
+// Where to break a text that is wider than `width`: at the last blank that leaves no more than that, else within the word.
+std::size_t BreakOf(std::string_view text, std::size_t width) {
+  std::size_t end = 0;
+  for (std::size_t characters = 0; characters < width; ++characters)
+    end += std::max<std::size_t>(FirstOf(text.substr(end)).size, 1);
+  std::size_t const blank = text.find_last_of(' ', end);
+  return blank != text.npos && text.find_first_not_of(' ') < blank ? blank : end;
+}
+
+// ---- Columns ----
+
+constexpr std::size_t kGap = 2;  // between two columns
+
+using TWidths = std::vector<std::size_t>;
+
+// Blanks at the start belong to the first word.
+std::size_t LongestWordIn(std::string_view cell) {
+  std::size_t longest = 0, start = 0;
+  std::size_t word = std::min(cell.find_first_not_of(' '), cell.size());
+  while (start < cell.size()) {
+    std::size_t const end = std::min(cell.find(' ', word), cell.size());
+    longest = std::max(longest, WidthOf(cell.substr(start, end - start)));
+    start = word = std::min(cell.find_first_not_of(' ', end), cell.size());
+  }
+  return longest;
+}
+
+std::size_t LineWidthOf(TWidths const& widths) {
+  return std::accumulate(widths.begin(), widths.end(), kGap * (widths.size() - 1));
+}
+
+// The column in which the first number exceeds the second by most; none when it does so in no column.
+std::optional<std::size_t> WidestDifference(TWidths const& more, TWidths const& less) {
+  std::optional<std::size_t> widest;
+  for (std::size_t at = 0; at < more.size(); ++at)
+    if (more[at] > less[at] && (!widest || more[at] - less[at] > more[*widest] - less[*widest])) widest = at;
+  return widest;
+}
+
+void Narrow(TWidths& widths, TWidths const& needed, std::size_t lineWidth) {
+  while (LineWidthOf(widths) > lineWidth) {
+    auto const column = WidestDifference(widths, needed);
+    if (!column) return;
+    --widths[*column];
+  }
+}
+
+void Widen(TWidths& widths, TWidths const& wanted, std::size_t lineWidth) {
+  while (LineWidthOf(widths) < lineWidth) {
+    auto const column = WidestDifference(wanted, widths);
+    if (!column) return;
+    ++widths[*column];
+  }
+}
+
+}  // namespace
+
+std::string Printable(std::string_view text) {
+  return WithEscaped(text, [](TCharacter const& character) { return character.size == 0 || IsHarmful(character.code); });
+}
+
+std::string WithBytesEscaped(std::string_view text) {
+  return WithEscaped(text, [](TCharacter const& character) { return character.size == 0 || character.code == 0; });
+}
+
+std::size_t WidthOf(std::string_view text) {
+  return static_cast<std::size_t>(
+      std::count_if(text.begin(), text.end(), [](char c) { return (static_cast<unsigned char>(c) & 0xc0) != 0x80; }));
+}
+
+std::vector<std::string> Wrapped(std::string_view text, std::size_t width) {
+  std::vector<std::string> lines;
+  while (IsWiderThan(text, width)) {
+    std::size_t const end = BreakOf(text, width);
+    lines.push_back(WithoutTrailingBlanks(text.substr(0, end)));
+    text.remove_prefix(end);
+    text.remove_prefix(std::min(text.find_first_not_of(' '), text.size()));
+  }
+  if (!text.empty() || lines.empty()) lines.push_back(WithoutTrailingBlanks(text));
+  return lines;
+}
+
+std::string Joined(std::vector<std::string> const& texts, std::string const& separator) {
+  std::string joined;
+  for (std::string const& text : texts) joined += (&text == &texts.front() ? "" : separator) + text;
+  return joined;
+}
+
+std::string SizeText(std::uint64_t bytes) {
+  constexpr char const* units[] = {"B", "KiB", "MiB", "GiB", "TiB"};
+  double size = static_cast<double>(bytes);
+  std::size_t unit = 0;
+  for (; unit + 1 < std::size(units) && size >= 1023.95; ++unit) size /= 1024;  // what would be rounded to 1024
+  long const tenths = std::lround(size * 10);
+  std::string const digit = tenths % 10 == 0 ? "" : "." + std::to_string(tenths % 10);
+  return std::to_string(tenths / 10) + digit + " " + units[unit];
+}
+
+std::string ExactSizeText(std::uint64_t bytes) {
+  constexpr char const* units[] = {"bytes", "KiB", "MiB", "GiB", "TiB"};
+  std::size_t unit = 0;
+  for (; unit + 1 < std::size(units) && bytes >= 1024 && bytes % 1024 == 0; ++unit) bytes /= 1024;
+  return std::to_string(bytes) + " " + units[unit];
+}
+
+void TTable::Add(std::vector<std::string> const& cells) {
+  std::vector<std::string> row;
+  for (std::string const& cell : cells) row.push_back(Printable(cell));
+  fRows.push_back(std::move(row));
+}
+
+std::vector<std::size_t> TTable::WidthsFor(ELayout layout, std::size_t lineWidth) const {
+  TWidths needed(fWidths.size()), whole(fWidths.size());
+  for (auto const& row : fRows)
+    for (std::size_t at = 0; at < row.size(); ++at) {
+      // One that would take more than three quarters of the line is cut rather.
+      std::size_t const longest = LongestWordIn(row[at]);
+      if (longest <= lineWidth / 4 * 3) needed[at] = std::max(needed[at], longest);
+      whole[at] = std::max(whole[at], WidthOf(row[at]));
+    }
+  if (layout == ELayout::kPlain) return whole;
+
+  TWidths widths = fWidths;
+  for (std::size_t at = 0; at < widths.size(); ++at) widths[at] = std::max(widths[at], needed[at]);
+  Narrow(widths, needed, lineWidth);
+  if (layout == ELayout::kTerminal) Widen(widths, whole, lineWidth);
+  return widths;
+}
+
+std::string TTable::TextFor(ELayout layout, std::size_t lineWidth) const {
+  TWidths const widths = WidthsFor(layout, lineWidth);
+  std::string text;
+  for (auto const& row : fRows) {
+    std::vector<std::vector<std::string>> cells;
+    std::size_t height = 0;
+    for (std::size_t at = 0; at < row.size(); ++at) {
+      cells.push_back(Wrapped(row[at], widths[at]));
+      height = std::max(height, cells.back().size());
+    }
+    for (std::size_t number = 0; number < height; ++number) {
+      std::string line;
+      std::size_t column = 0;  // where the next cell begins
+      for (std::size_t at = 0; at < cells.size(); ++at) {
+        std::string const cell = number < cells[at].size() ? cells[at][number] : "";
+        if (!cell.empty()) line.append(column - WidthOf(line), ' ').append(cell);
+        column += widths[at] + kGap;
+      }
+      text += line + "\n";
+    }
+  }
+  return text;
+}
+
+}  // namespace NQRVZEP20::zep

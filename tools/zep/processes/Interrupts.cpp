@@ -1,0 +1,42 @@
+#include "tools/zep/processes/Interrupts.h"
+
+#include <signal.h>
+
+#include <array>
+#include <stdexcept>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+constexpr std::array<int, 3> kSignals = {SIGHUP, SIGINT, SIGTERM};
+
+volatile sig_atomic_t gPending = 0;
+std::array<struct sigaction, kSignals.size()> gBefore;
+
+void Remember(int signal) { gPending = signal; }
+
+}  // namespace
+
+TInterruptGuard::TInterruptGuard() {
+  struct sigaction action {};
+  action.sa_handler = Remember;  // without SA_RESTART
+  for (std::size_t n = 0; n < kSignals.size(); ++n) {
+    ::sigaction(kSignals[n], nullptr, &gBefore[n]);
+    if (gBefore[n].sa_handler != SIG_IGN) ::sigaction(kSignals[n], &action, nullptr);
+  }
+}
+
+TInterruptGuard::~TInterruptGuard() {
+  for (std::size_t n = 0; n < kSignals.size(); ++n) ::sigaction(kSignals[n], &gBefore[n], nullptr);
+  if (gPending != 0) ::raise(gPending);
+  gPending = 0;
+}
+
+int PendingInterrupt() { return gPending; }
+
+void ThrowIfInterrupted() {
+  if (gPending != 0) throw std::runtime_error("interrupted");
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,85 @@
+#include "tools/zep/processes/TChildProcess.h"
+
+#include <fcntl.h>
+#include <signal.h>
+#include <sys/prctl.h>
+#include <sys/wait.h>
+
+#include <system_error>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TPipe {
+  TDescriptor fReadEnd, fWriteEnd;
+};
+
+TPipe PipeOrThrow() {
+  int ends[2];
+  if (::pipe2(ends, O_CLOEXEC) != 0) throw std::system_error(errno, std::generic_category(), "no pipe");
+  return {TDescriptor(ends[0]), TDescriptor(ends[1])};
+}
+
+pid_t ForkOrThrow() {
+  pid_t const child = ::fork();
+  if (child < 0) throw std::system_error(errno, std::generic_category(), "no process");
+  return child;
+}
+
+[[noreturn]] void WorkInChild(std::function<std::string()> const& work, int signalOfOrphan, int output) {
+  ::prctl(PR_SET_PDEATHSIG, signalOfOrphan);
+  bool isWritten = false;
+  try {
+    isWritten = WriteWhole(output, work());
+  } catch (...) {
+    // The parent sees that the end is missing.
+  }
+  ::_exit(isWritten ? 0 : 1);
+}
+
+}  // namespace
+
+TChildProcess::TChildProcess(std::function<std::string()> const& work, int signalOfOrphan) {
+  TPipe pipe = PipeOrThrow();
+  fId = ForkOrThrow();
+  if (fId == 0) WorkInChild(work, signalOfOrphan, pipe.fWriteEnd.Get());
+  fOutput = std::move(pipe.fReadEnd);
+}
+
+TChildProcess::~TChildProcess() { Kill(); }
+
+TChildProcess::TChildProcess(TChildProcess&& other) noexcept
+    : fOutput(std::move(other.fOutput)), fId(std::exchange(other.fId, -1)) {}
+
+TChildProcess& TChildProcess::operator=(TChildProcess&& other) noexcept {
+  std::swap(fOutput, other.fOutput);
+  std::swap(fId, other.fId);
+  return *this;
+}
+
+bool TChildProcess::Read(std::string& text) {
+  char chunk[4096];
+  ssize_t const got = ::read(Output(), chunk, sizeof chunk);
+  if (got < 0 && errno == EINTR) return true;
+  if (got <= 0) return false;
+  text.append(chunk, static_cast<std::size_t>(got));
+  return true;
+}
+
+bool TChildProcess::End() {
+  int status = -1;
+  if (fId > 0) {
+    while (::waitpid(fId, &status, 0) < 0 && errno == EINTR) continue;
+  }
+  fId = -1;
+  fOutput = TDescriptor();
+  return status == 0;
+}
+
+void TChildProcess::Kill() {
+  if (fId > 0) ::kill(fId, SIGKILL);
+  End();
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,22 @@
+#include "tools/zep/processes/TScratchDirectory.h"
+
+#include <stdlib.h>
+
+#include <cerrno>
+#include <filesystem>
+#include <system_error>
+
+namespace NQRVZEP20::zep {
+
+namespace fs = std::filesystem;
+
+TScratchDirectory::TScratchDirectory(std::string const& name) : fPath((fs::temp_directory_path() / (name + ".XXXXXX")).string()) {
+  if (::mkdtemp(fPath.data()) == nullptr) throw std::system_error(errno, std::generic_category(), "no temporary directory");
+}
+
+TScratchDirectory::~TScratchDirectory() {
+  std::error_code ignored;
+  if (!fIsKept) fs::remove_all(fPath, ignored);
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,59 @@
+#include "tools/zep/secrets/PrivateFile.h"
+
+#include "tools/zep/output/Text.h"
+#include "tools/zep/processes/Descriptor.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <iostream>
+#include <set>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+constexpr std::size_t kMostBytes = 1 << 20;
+
+std::string Octal(mode_t mode) {
+  char text[16];
+  std::snprintf(text, sizeof text, "%04o", static_cast<unsigned>(mode & 07777));
+  return text;
+}
+
+}  // namespace
+
+TPrivateFile::TPrivateFile(std::string const& path) : fPath(path) {
+  TDescriptor const file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NOCTTY));
+  struct stat status {};
+  if (file && ::fstat(file.Get(), &status) == 0) fMode = status.st_mode;
+  TSecretBytes chunk(4096);
+  ssize_t got = file ? 1 : -1;
+  while (got > 0 && fText.size() < kMostBytes) {
+    got = ::read(file.Get(), chunk.data(), chunk.size());
+    if (got < 0 && errno == EINTR)
+      got = 1;
+    else if (got > 0)
+      fText.insert(fText.end(), chunk.begin(), chunk.begin() + got);
+  }
+  if (got < 0) fError = errno;
+}
+
+void TPrivateFile::WarnWhenOthersMayRead() const {
+  static std::set<std::string> warned;
+  if (!S_ISREG(fMode) || (fMode & S_IROTH) == 0 || !warned.insert(fPath).second) return;
+  std::cerr << "zep: warning: every user may read the passwords in " << Printable(fPath) << " (mode " << Octal(fMode)
+            << "); chmod 600 makes it private\n";
+}
+
+std::string NameOfPrivateFile(std::string const& path, std::string const& option) {
+  bool const isNothing = ::access(path.c_str(), F_OK) != 0;
+  int const error = errno;
+  std::string const name = isNothing ? "the file of " + option : path;
+  errno = error;
+  return name;
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,34 @@
+#pragma once
+
+#include "tools/zep/secrets/TSecret.h"
+
+#include <sys/types.h>
+
+#include <string>
+#include <string_view>
+
+namespace NQRVZEP20::zep {
+
+// A file with passwords, read whole into memory that is overwritten at the end.
+class TPrivateFile {
+public:
+  // Reads at most 1 MiB. What cannot be read leaves the text empty, with the reason in Error().
+  explicit TPrivateFile(std::string const& path);
+
+  std::string_view Text() const { return {fText.data(), fText.size()}; }
+  int Error() const { return fError; }  // errno; 0 when it was read
+
+  // A warning on standard error, once for a path, when it is a regular file that every user may read.
+  void WarnWhenOthersMayRead() const;
+
+private:
+  std::string fPath;
+  TSecretBytes fText;
+  int fError = 0;
+  mode_t fMode = 0;
+};
+
+// A file for messages. What names nothing may be a password in the place of the file; the option is named instead.
+std::string NameOfPrivateFile(std::string const& path, std::string const& option);
+
+}  // namespace NQRVZEP20::zep

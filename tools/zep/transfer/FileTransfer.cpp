@@ -1,0 +1,420 @@
+#include "tools/zep/transfer/FileTransfer.h"
+
+#include "ILogger.h"
+#include "TRootObject.h"
+#include "TZEPException.h"
+#include "tools/zep/processes/Descriptor.h"
+#include "tools/zep/transfer/Curl.h"
+#include "tools/zep/transfer/UrlCoding.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <array>
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <random>
+#include <vector>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+[[noreturn]] void Fail(EZEPStatusCode status, std::string const& reason) {
+  if (ILogger* const logger = TRootObject::GetCoreLogger()) logger->OutputLogEntry(ILogger::kLogError, reason);
+  throw TZEPException(status);
+}
+
+// ---- libcurl ----
+
+using TCommands = std::vector<std::string>;
+
+// libcurl, and one connection that goes on from one transfer to the next.
+class TConnection {
+public:
+  TConnection() {
+    std::string failure;
+    if (!Load(fCurl, failure))
+      Fail(kZEPStatusLibCurlFailure,
+           (fCurl.fLibrary ? "Error loading curl library: " : "Error opening curl library: ") + failure);
+    if (fCurl.fGlobalInit(CURL_GLOBAL_ALL) == CURLE_OK) fHandle = fCurl.fInit();
+    if (fHandle == nullptr) Fail(kZEPStatusLibCurlFailure, "Error initalizing curl");
+    Set(CURLOPT_ERRORBUFFER, fError.data());
+    Set(CURLOPT_FTP_USE_EPSV, 0L);
+    Set(CURLOPT_PROXY, "");
+  }
+  ~TConnection() {
+    fCurl.fCleanup(fHandle);
+    for (curl_slist* const list : fLists) fCurl.fFreeAll(list);
+    fCurl.fGlobalCleanup();
+  }
+  TConnection(TConnection const&) = delete;
+  TConnection& operator=(TConnection const&) = delete;
+
+  template <class TValue>
+  void Set(CURLoption option, TValue value) {
+    fCurl.fSetOption(fHandle, option, value);
+  }
+
+  // What the server is to do after the next transfers.
+  void SetCommandsAfter(TCommands const& commands) {
+    curl_slist* list = nullptr;
+    for (std::string const& command : commands) list = fCurl.fAppend(list, command.c_str());
+    fLists.push_back(list);
+    Set(CURLOPT_POSTQUOTE, list);
+  }
+
+  CURLcode Perform(std::string const& url) {
+    fError[0] = '\0';
+    Set(CURLOPT_URL, url.c_str());
+    return fCurl.fPerform(fHandle);
+  }
+
+  // When the remote file of this transfer was changed last; -1 when the server does not tell.
+  std::int64_t RemoteTime() const {
+    curl_off_t time = -1;
+    return fCurl.fGetInfo(fHandle, CURLINFO_FILETIME_T, &time) == CURLE_OK ? time : -1;
+  }
+
+  std::string ErrorText() const { return fError.data(); }
+
+  [[noreturn]] static void FailFor(CURLcode code, std::string const& errorText) {
+    if (code == CURLE_COULDNT_RESOLVE_HOST || code == CURLE_COULDNT_CONNECT)
+      Fail(kZEPStatusConnectionFailed, "Error connecting to Server");
+    Fail(kZEPStatusAccessDenied, "Error performing command: " + errorText);
+  }
+
+private:
+  TCurl fCurl;
+  CURL* fHandle = nullptr;
+  std::vector<curl_slist*> fLists;
+  std::array<char, CURL_ERROR_SIZE> fError{};
+};
+
+// ---- Uploads ----
+
+struct TSource {
+  TDescriptor fFile;
+  TTransferState& fState;
+  unsigned fMark;  // of fState.fLeft
+};
+
+// libcurl's callback before a transfer whose connection is there. A libcurl before 7.80 has none; ReadSource has to do.
+int MarkBegun(void* context, char*, char*, int, int) {
+  TSource& source = *static_cast<TSource*>(context);
+  source.fState.fLeft |= source.fMark;
+  return CURL_PREREQFUNC_OK;
+}
+
+// libcurl's read callback.
+std::size_t ReadSource(char* bytes, std::size_t size, std::size_t count, void* context) {
+  TSource& source = *static_cast<TSource*>(context);
+  source.fState.fLeft |= source.fMark;
+  ssize_t got = -1;
+  while ((got = ::read(source.fFile.Get(), bytes, size * count)) < 0 && errno == EINTR) continue;
+  if (got < 0) {
+    source.fState.fReadError = errno;
+    return CURL_READFUNC_ABORT;
+  }
+  source.fState.fMoved += static_cast<std::uint64_t>(got);
+  return static_cast<std::size_t>(got);
+}
+
+std::string DirectoryOf(std::string const& path) { return path.substr(0, path.rfind('/') + 1); }
+std::string NameIn(std::string const& path) { return path.substr(path.rfind('/') + 1); }
+
+bool HasControlCharacter(std::string const& text) {
+  for (unsigned char const c : text)
+    if (c < 0x20 || c == 0x7f) return true;
+  return false;
+}
+
+// A name that no other transfer has.
+std::string TemporaryNameFor(std::string const& name) {
+  constexpr std::size_t kLongest = 200;  // names of 255 bytes are common, and the rest needs some
+  char number[16];
+  std::snprintf(number, sizeof number, ".%08x", static_cast<unsigned>(std::random_device()()));
+  return name.substr(0, kLongest) + number + ".part";
+}
+
+std::string QuotedForSftp(std::string const& path) {
+  std::string quoted = "\"";
+  for (char const c : path) {
+    if (c == '"' || c == '\\' || c == '\'') quoted += '\\';
+    quoted += c;
+  }
+  return quoted + "\"";
+}
+
+// A place on the server, and the names beside it, as the server's commands have them.
+class TNames {
+public:
+  explicit TNames(TRemote const& place) : fPlace(place), fName(Decoded(NameIn(place.fPath))), fDirectory(place) {
+    fDirectory.fPath = DirectoryOf(place.fPath);
+  }
+
+  std::string const& Name() const { return fName; }
+  std::string Url() const { return UrlOf(fPlace); }
+  std::string DirectoryUrl() const { return UrlOf(fDirectory); }
+  std::string UrlOfOther(std::string const& name) const { return UrlOf(Beside(fPlace, name)); }
+
+  TCommands Renaming(std::string const& from, std::string const& to) const {
+    if (IsSftp()) return {"rename " + SftpPath(from) + " " + SftpPath(to)};
+    return {"RNFR " + from, "RNTO " + to};
+  }
+  TCommands Removal(std::string const& name) const { return {IsSftp() ? "rm " + SftpPath(name) : "DELE " + name}; }
+
+private:
+  bool IsSftp() const { return fPlace.fScheme == "sftp"; }
+  // FTP commands are about the directory that libcurl has changed to; SFTP's need the path.
+  std::string SftpPath(std::string const& name) const {
+    std::string const path = "/" + Decoded(fDirectory.fPath) + name;
+    return QuotedForSftp(path.rfind("/~/", 0) == 0 ? path.substr(3) : path);
+  }
+
+  TRemote fPlace;
+  std::string fName;
+  TRemote fDirectory;
+};
+
+class TUpload {
+public:
+  TUpload(TRemote const& place, TUploadNames const& names, std::string const& file, int cleanUpSeconds, TTransferState& state)
+      : fNames(place), fOthers(names), fFile(file), fCleanUpSeconds(cleanUpSeconds), fState(state) {
+    fConnection.Set(CURLOPT_FTP_CREATE_MISSING_DIRS, 1L);
+  }
+
+  void Run() {
+    if (HasControlCharacter(fNames.Name())) return SendToThePlace();  // which libcurl refuses
+    std::string const& temporary = fOthers.fTemporary;
+    CURLcode const code = Send(fNames.UrlOfOther(temporary), fNames.Renaming(temporary, fNames.Name()), kLeftTemporary);
+    if (code == CURLE_OK) return SetLeft(kLeftTemporary, false);
+    if (code == CURLE_QUOTE_ERROR) return RenameOrSendAnew();
+    if (!IsNothingWritten(code)) GiveUp(code);
+    SetLeft(kLeftTemporary, false);
+    SendToThePlace();
+  }
+
+  // What is at the place is spared where nothing of this upload arrived: it may be the file that was there before.
+  void RemoveParts() {
+    if (fState.fLeft & kLeftTemporary) Remove(fOthers.fTemporary, kLeftTemporary);
+    if ((fState.fLeft & kLeftAtPlace) && fState.fMoved > 0) Remove(fNames.Name(), kLeftAtPlace);
+  }
+
+private:
+  static bool IsRefusal(CURLcode code) {
+    return code == CURLE_UPLOAD_FAILED || code == CURLE_REMOTE_ACCESS_DENIED || code == CURLE_REMOTE_FILE_EXISTS ||
+           code == CURLE_REMOTE_FILE_NOT_FOUND || code == CURLE_SSH;
+  }
+
+  bool IsNothingWritten(CURLcode code) const { return fState.fMoved == 0 && fState.fReadError == 0 && IsRefusal(code); }
+
+  void SetLeft(ELeft what, bool isLeft) {
+    if (isLeft)
+      fState.fLeft |= what;
+    else
+      fState.fLeft &= ~static_cast<unsigned>(what);
+  }
+
+  // Once the server may have begun to write, `mark` is left there.
+  CURLcode Send(std::string const& url, TCommands const& commandsAfter, ELeft mark) {
+    TSource source{TDescriptor(::open(fFile.c_str(), O_RDONLY | O_CLOEXEC)), fState, mark};
+    if (!source.fFile) {
+      fState.fReadError = errno;
+      return CURLE_READ_ERROR;
+    }
+    fConnection.Set(CURLOPT_NOBODY, 0L);
+    fConnection.Set(CURLOPT_UPLOAD, 1L);
+    fConnection.Set(CURLOPT_TIMEOUT, 0L);
+    fConnection.Set(CURLOPT_READFUNCTION, &ReadSource);
+    fConnection.Set(CURLOPT_READDATA, &source);
+    fConnection.Set(CURLOPT_PREREQFUNCTION, &MarkBegun);
+    fConnection.Set(CURLOPT_PREREQDATA, &source);
+    fConnection.SetCommandsAfter(commandsAfter);
+    return fConnection.Perform(url);
+  }
+
+  CURLcode Command(TCommands const& commands) {
+    fConnection.Set(CURLOPT_UPLOAD, 0L);
+    fConnection.Set(CURLOPT_NOBODY, 1L);
+    fConnection.Set(CURLOPT_TIMEOUT, static_cast<long>(fCleanUpSeconds));
+    fConnection.Set(CURLOPT_PREREQFUNCTION, static_cast<curl_prereq_callback>(nullptr));
+    fConnection.SetCommandsAfter(commands);
+    return fConnection.Perform(fNames.DirectoryUrl());
+  }
+
+  void Remove(std::string const& name, ELeft what) {
+    if (Command(fNames.Removal(name)) == CURLE_OK) SetLeft(what, false);
+  }
+
+  // The file has arrived, but did not get its name. Some servers do not rename onto another file: that is moved out of the way.
+  void RenameOrSendAnew() {
+    std::string const &name = fNames.Name(), &temporary = fOthers.fTemporary, &former = fOthers.fFormer;
+    SetLeft(kLeftFormer, true);
+    CURLcode const moved = Command(fNames.Renaming(name, former));
+    if (moved == CURLE_QUOTE_ERROR) SetLeft(kLeftFormer, false);  // refused
+    if (moved == CURLE_OK) {
+      if (Command(fNames.Renaming(temporary, name)) == CURLE_OK) {
+        SetLeft(kLeftTemporary, false);
+        return Remove(former, kLeftFormer);
+      }
+      if (Command(fNames.Renaming(former, name)) == CURLE_OK) SetLeft(kLeftFormer, false);
+    }
+    Remove(temporary, kLeftTemporary);
+    fState.fMoved = 0;
+    SendToThePlace();
+  }
+
+  void SendToThePlace() {
+    CURLcode const code = Send(fNames.Url(), {}, kLeftAtPlace);
+    if (code == CURLE_OK || IsNothingWritten(code)) SetLeft(kLeftAtPlace, false);
+    if (code != CURLE_OK) GiveUp(code);
+    if (fState.fLeft & kLeftFormer) Remove(fOthers.fFormer, kLeftFormer);
+  }
+
+  // Removes what may have arrived, and fails.
+  [[noreturn]] void GiveUp(CURLcode code) {
+    std::string const reason = fConnection.ErrorText();
+    RemoveParts();
+    TConnection::FailFor(code, reason);
+  }
+
+  TConnection fConnection;
+  TNames const fNames;
+  TUploadNames const fOthers;
+  std::string const fFile;
+  int const fCleanUpSeconds;
+  TTransferState& fState;
+};
+
+// ---- Downloads ----
+
+class TDownload {
+public:
+  TDownload(std::string const& file, bool isThere, std::uint64_t mostBytes, TTransferState& state)
+      : fPath(file), fMostBytes(mostBytes), fState(state), fIsThere(isThere) {
+    fConnection.Set(CURLOPT_WRITEFUNCTION, &Write);
+    fConnection.Set(CURLOPT_WRITEDATA, this);
+    fConnection.Set(CURLOPT_FILETIME, 1L);
+    fConnection.Set(CURLOPT_MAXFILESIZE_LARGE, static_cast<curl_off_t>(mostBytes));  // where the server tells the size
+  }
+
+  void Run(std::string const& url) {
+    struct stat status {};
+    bool const isMarked = fIsThere && ::lstat(fPath.c_str(), &status) == 0 && S_ISREG(status.st_mode) && status.st_size > 0 &&
+                          status.st_mtim.tv_nsec == 0;
+    if (isMarked) {
+      fStart = static_cast<std::uint64_t>(status.st_size);
+      fTimeOfPart = status.st_mtim.tv_sec;
+    }
+    CURLcode code = Fetch(url);
+    if (fStart > 0 && IsStartedAnew(code)) {
+      fStart = 0;
+      fIsOther = false;
+      code = Fetch(url);
+    }
+    bool const isWholeTooLarge = code == CURLE_OK && fMostBytes > 0 && fStart > fMostBytes;
+    if (code == CURLE_FILESIZE_EXCEEDED || isWholeTooLarge) fState.fIsTooLarge = true;
+    if (fState.fIsTooLarge) FailFor(code);
+    if (code == CURLE_OK && !fFile) Open();  // of an empty remote file no byte comes
+    if (code != CURLE_OK || fError != 0) FailFor(code);
+  }
+
+private:
+  CURLcode Fetch(std::string const& url) {
+    fState.fMoved = fStart;
+    fConnection.Set(CURLOPT_RESUME_FROM_LARGE, static_cast<curl_off_t>(fStart));
+    return fConnection.Perform(url);
+  }
+
+  // Whether what is there cannot be a beginning: the remote file is another one by now, or the server cannot start in the middle.
+  bool IsStartedAnew(CURLcode code) {
+    bool const isWhole = code == CURLE_OK && !fFile;  // nothing was missing, if it is the same file
+    if (isWhole) return fConnection.RemoteTime() != fTimeOfPart;
+    return fIsOther || code == CURLE_BAD_DOWNLOAD_RESUME || code == CURLE_FTP_COULDNT_USE_REST || code == CURLE_RANGE_ERROR;
+  }
+
+  // False, with fError or fIsOther, when nothing may be written.
+  bool Open() {
+    fState.fRemoteTime = fConnection.RemoteTime();
+    fIsOther = fStart > 0 && fState.fRemoteTime != fTimeOfPart;
+    if (fIsOther) return false;
+    int const how = fStart > 0 ? O_APPEND : fIsThere ? O_CREAT | O_TRUNC : O_CREAT | O_EXCL;
+    fFile = TDescriptor(::open(fPath.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC | how, 0666));
+    if (!fFile) fError = errno;
+    return static_cast<bool>(fFile);
+  }
+
+  // libcurl's write callback. Another result than the number of bytes ends the transfer.
+  static std::size_t Write(char const* bytes, std::size_t size, std::size_t count, void* context) {
+    TDownload& self = *static_cast<TDownload*>(context);
+    std::size_t const length = size * count;
+    if (!self.fFile && !self.Open()) return length + 1;
+    if (self.fMostBytes > 0 && self.fState.fMoved + length > self.fMostBytes) {
+      self.fState.fIsTooLarge = true;
+      return length + 1;
+    }
+    if (!WriteWhole(self.fFile.Get(), {bytes, length})) {
+      self.fError = errno;
+      return length + 1;
+    }
+    self.fState.fMoved += length;
+    return length;
+  }
+
+  [[noreturn]] void FailFor(CURLcode code) {
+    if (fError == EEXIST) throw TZEPException(kZEPStatusAlreadyExists);
+    if (fError != 0) Fail(kZEPStatusFileSystemError, std::strerror(fError));
+    TConnection::FailFor(code, fConnection.ErrorText());
+  }
+
+  TConnection fConnection;
+  std::string const fPath;
+  std::uint64_t const fMostBytes;
+  TTransferState& fState;
+  TDescriptor fFile;
+  bool const fIsThere;            // whether a file of that name was there before
+  std::uint64_t fStart = 0;       // what is there of it
+  std::int64_t fTimeOfPart = -1;  // the time of that
+  bool fIsOther = false;          // the remote file is not the one that it came from
+  int fError = 0;                 // errno of writing
+};
+
+}  // namespace
+
+TUploadNames NamesForUpload(TRemote const& place) {
+  std::string const name = Decoded(NameIn(place.fPath));
+  return {TemporaryNameFor(name), TemporaryNameFor(name)};
+}
+
+TRemote Beside(TRemote const& place, std::string const& name) {
+  TRemote other = place;
+  other.fPath = DirectoryOf(place.fPath) + EncodedName(name);
+  return other;
+}
+
+TZEPStatusCode Upload(TRemote const& place, TUploadNames const& names, std::string const& file, int cleanUpSeconds,
+                      TTransferState& state) {
+  TUpload(place, names, file, cleanUpSeconds, state).Run();
+  return kZEPStatusOK;
+}
+
+void RemoveParts(TRemote const& place, TUploadNames const& names, int cleanUpSeconds, TTransferState& state) {
+  TUpload(place, names, "", cleanUpSeconds, state).RemoveParts();
+}
+
+TZEPStatusCode Download(TRemote const& remote, std::string const& file, bool isThere, std::uint64_t mostBytes,
+                        TTransferState& state) {
+  TDownload(file, isThere, mostBytes, state).Run(UrlOf(remote));
+  return kZEPStatusOK;
+}
+
+void MarkForResuming(std::string const& part, TTransferState const& state) {
+  if (state.fRemoteTime < 0) return;
+  timespec const times[] = {{0, UTIME_OMIT}, {static_cast<time_t>(state.fRemoteTime), 0}};
+  ::utimensat(AT_FDCWD, part.c_str(), times, AT_SYMLINK_NOFOLLOW);
+}
+
+}  // namespace NQRVZEP20::zep

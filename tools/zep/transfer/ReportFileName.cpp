@@ -1,0 +1,39 @@
+#include "tools/zep/Report.h"
+
+#include <algorithm>
+#include <cctype>
+#include <ctime>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+constexpr std::size_t kLongestHostName = 64;
+
+std::string HostNameIn(TReport const& report) {
+  for (TReportRow const& row : report.fIdentity)
+    if (row.fKey == "hostName" && row.fAnswer.fIsKnown) return row.fAnswer.fValue;
+  return "unknown";
+}
+
+std::string Cleaned(std::string host) {
+  auto const isRisky = [](unsigned char c) { return std::isalnum(c) == 0 && c != '-'; };
+  std::replace_if(host.begin(), host.end(), isRisky, '_');
+  return host.substr(0, kLongestHostName);
+}
+
+std::string TimeText() {
+  std::time_t const now = std::time(nullptr);
+  std::tm fields{};
+  char text[32];
+  std::strftime(text, sizeof text, "%Y%m%dT%H%M%SZ", ::gmtime_r(&now, &fields));
+  return text;
+}
+
+}  // namespace
+
+std::string ReportFileName(TReport const& report, char const* extension) {
+  return "zep-report-" + Cleaned(HostNameIn(report)) + "-" + TimeText() + extension;
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,435 @@
+#include "tools/zep/transfer/Transfer.h"
+
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/Terminal.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/processes/Descriptor.h"
+#include "tools/zep/processes/TChildProcess.h"
+#include "tools/zep/secrets/Secrets.h"
+#include "tools/zep/transfer/FileTransfer.h"
+#include "tools/zep/transfer/Sha256.h"
+#include "tools/zep/transfer/Unreachable.h"
+
+#include <fcntl.h>
+#include <linux/fs.h>
+#include <poll.h>
+#include <signal.h>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <CLI/CLI.hpp>
+
+#include <algorithm>
+#include <cctype>
+#include <cerrno>
+#include <charconv>
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
+#include <filesystem>
+#include <iostream>
+#include <limits>
+#include <string_view>
+#include <vector>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+std::string ReasonOf(int error) { return std::generic_category().message(error); }
+
+// ---- Progress ----
+
+// One line on the terminal of standard error, written over and over, and gone at the end.
+class TProgress {
+public:
+  TProgress(std::uint64_t total, bool isWanted) : fTotal(total), fIsShown(isWanted && CanRedrawErrors()) {}
+  ~TProgress() {
+    if (fIsShown) std::cerr << "\r\x1b[K" << std::flush;
+  }
+  TProgress(TProgress const&) = delete;
+  TProgress& operator=(TProgress const&) = delete;
+
+  void Show(std::uint64_t bytes) {
+    if (!fIsShown) return;
+    double const seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - fStart).count();
+    std::string line = "\r\x1b[K";
+    if (fTotal > 0) line += Bar(bytes) + " of " + SizeText(fTotal) + ", ";
+    line += SizeText(bytes) + ", " + SizeText(static_cast<std::uint64_t>(static_cast<double>(bytes) / seconds)) + "/s";
+    std::cerr << line << std::flush;
+  }
+
+private:
+  std::string Bar(std::uint64_t bytes) const {
+    constexpr std::uint64_t kWidth = 30;
+    std::uint64_t const share = std::min(bytes, fTotal);
+    std::string bar(share * kWidth / fTotal, '#');
+    bar.resize(kWidth, '.');
+    return "[" + bar + "] " + std::to_string(share * 100 / fTotal) + " %";
+  }
+
+  std::uint64_t fTotal;  // 0: not known
+  bool fIsShown;
+  std::chrono::steady_clock::time_point fStart = std::chrono::steady_clock::now();
+};
+
+TOutcome Transfer(std::function<TZEPStatusCode()> const& transfer, TTransferState const& state, std::uint64_t total,
+                  TTransferOptions const& options) {
+  TProgress progress(total, !options.fQuiet);
+  TWatch watch;
+  watch.fMoved = &state.fMoved;
+  watch.fStallSeconds = options.fStallSeconds;
+  watch.fShowProgress = [&progress](std::uint64_t bytes) { progress.Show(bytes); };
+  return RunWatched(transfer, watch);
+}
+
+// Says more of a connection that failed than the library does: which of the ways it was.
+void ExplainNoConnection(TOutcome& outcome, TRemote const& remote) {
+  constexpr int kProbeSeconds = 3;
+  if (outcome.fExit != kExitNoConnection) return;
+  std::string const usualPort = remote.fScheme == "sftp" ? "22" : "21";
+  std::string const why = WhyUnreachable(remote.fHost, remote.fPort.empty() ? usualPort : remote.fPort, kProbeSeconds);
+  if (!why.empty()) outcome.fReason += ": " + Printable(why);
+}
+
+TTransferred TransferOf(TRemote const& remote, std::string const& file) {
+  TTransferred transferred;
+  transferred.fUrl = ShownUrlOf(remote);
+  transferred.fFile = file;
+  return transferred;
+}
+
+TTransferred Failed(TTransferred transferred, EExitStatus exit, std::string const& reason) {
+  transferred.fOutcome = {kZEPStatusFail, exit, reason};
+  return transferred;
+}
+
+// Reads "500K" into the bytes; returns why that cannot be, or an empty text.
+std::string WhyNoSize(std::string const& text, std::uint64_t& bytes) {
+  constexpr std::string_view kUnits = "KMGT";
+  std::uint64_t number = 0;
+  auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+  std::string_view const unit(end, static_cast<std::size_t>(text.data() + text.size() - end));
+  std::size_t const power = unit.size() == 1 ? kUnits.find(static_cast<char>(std::toupper(unit[0]))) : kUnits.npos;
+  bool const isRead = error == std::errc() && (unit.empty() || power != kUnits.npos);
+  unsigned const shift = unit.empty() ? 0 : 10 * (static_cast<unsigned>(power) + 1);
+  if (!isRead || number > (std::numeric_limits<std::uint64_t>::max() >> 1 >> shift)) return "it is not a size";
+  bytes = number << shift;
+  return "";
+}
+
+bool IsSameFile(struct stat const& a, struct stat const& b) { return a.st_dev == b.st_dev && a.st_ino == b.st_ino; }
+
+// ---- Sending ----
+
+// Why a file cannot be sent; empty when it can.
+std::string WhyNotReadable(std::string const& file, struct stat& status) {
+  if (::stat(file.c_str(), &status) != 0) return ReasonOf(errno);
+  if (!S_ISREG(status.st_mode)) return "it is not a regular file";
+  TDescriptor const opened(::open(file.c_str(), O_RDONLY | O_CLOEXEC));
+  char first;
+  return opened && ::pread(opened.Get(), &first, 1, 0) >= 0 ? "" : ReasonOf(errno);
+}
+
+bool IsAsBefore(std::string const& file, struct stat const& before) {
+  struct stat now;
+  return ::stat(file.c_str(), &now) == 0 && IsSameFile(now, before) && now.st_size == before.st_size &&
+         now.st_mtim.tv_sec == before.st_mtim.tv_sec && now.st_mtim.tv_nsec == before.st_mtim.tv_nsec;
+}
+
+void AddName(TRemote& remote, std::string const& name) {
+  if (remote.fPath.empty() || remote.fPath.back() == '/') remote.fPath += EncodedName(name);
+}
+
+// Where the file arrives: on bootable media the library chooses the directory of a host.
+TRemote PlaceOf(TTarget const& target) {
+  char const* const isBootable = std::getenv("ZEP_ISBOOTABLE");
+  TRemote place = target.fRemote;
+  if (target.fIsHost && isBootable && std::string(isBootable) == "yes")
+    place.fPath = "hostline/toqrv/vantor/fdr_upload/" + place.fPath;
+  return place;
+}
+
+// How long a server has to remove what a broken transfer left: less than a standstill takes.
+int CleanUpSecondsOf(TTransferOptions const& options) {
+  constexpr int kMost = 10;
+  return options.fStallSeconds > 0 ? std::clamp(options.fStallSeconds / 2, 1, kMost) : kMost;
+}
+
+// Removes what an upload left whose process was ended, where the server can be reached soon. One more interrupt ends the wait.
+void CleanUp(TRemote const& place, TUploadNames const& names, int seconds, TTransferState& state) {
+  constexpr int kMost = 5;
+  int const limit = std::min(seconds, kMost);
+  TChildProcess const child(
+      [&] {
+        RemoveParts(place, names, limit, state);
+        return std::string("done");
+      },
+      SIGKILL);
+  pollfd waiting{child.Output(), POLLIN, 0};
+  ::poll(&waiting, 1, limit * 1000);
+}
+
+std::string JoinedByAnd(std::vector<std::string> const& texts) {
+  std::string joined;
+  for (std::string const& text : texts) joined += (joined.empty() ? "" : " and ") + text;
+  return joined;
+}
+
+// What is known besides of an upload: why its file could not be read, and what may be left on the server.
+void ExplainUpload(TTransferred& transferred, TRemote const& place, TUploadNames const& names, TTransferState const& state) {
+  TOutcome& outcome = transferred.fOutcome;
+  if (state.fReadError != 0) outcome = {outcome.fStatus, kExitNoInput, ReasonOf(state.fReadError)};
+  std::vector<std::string>& left = transferred.fLeftOnServer;
+  if (state.fLeft & kLeftTemporary) left.push_back(ShownUrlOf(Beside(place, names.fTemporary)));
+  if (state.fLeft & kLeftAtPlace) left.push_back(ShownUrlOf(place));
+  if (outcome.fExit != kExitComplete && !left.empty())
+    outcome.fReason += "; the server may have a part of it: " + JoinedByAnd(left);
+  if ((state.fLeft & kLeftFormer) == 0) return;
+  left.push_back(ShownUrlOf(Beside(place, names.fFormer)));
+  if (outcome.fExit != kExitComplete) outcome.fReason += "; the file that was there may now be " + left.back();
+}
+
+// ---- Fetching ----
+
+// A file that only one process at a time can have open so, and that is gone when it is done. One that a killed process left
+// is no hindrance.
+class TLockFile {
+public:
+  explicit TLockFile(std::string path) : fPath(std::move(path)) {
+    while (Open() && !IsStillThere()) Close();  // the one that had it has just removed it
+  }
+  ~TLockFile() {
+    if (fFile) ::unlink(fPath.c_str());
+  }
+  TLockFile(TLockFile const&) = delete;
+  TLockFile& operator=(TLockFile const&) = delete;
+
+  std::string const& WhyNotHad() const { return fWhyNotHad; }  // empty when it is
+
+private:
+  bool Open() {
+    fFile = TDescriptor(::open(fPath.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0666));
+    if (fFile && ::flock(fFile.Get(), LOCK_EX | LOCK_NB) == 0) return true;
+    fWhyNotHad = errno == EWOULDBLOCK ? "another transfer into the file goes on" : ReasonOf(errno);
+    Close();
+    return false;
+  }
+  void Close() { fFile = TDescriptor(); }
+  bool IsStillThere() const {
+    struct stat held, named;
+    return ::fstat(fFile.Get(), &held) == 0 && ::stat(fPath.c_str(), &named) == 0 && IsSameFile(held, named);
+  }
+
+  std::string fPath, fWhyNotHad;
+  TDescriptor fFile;
+};
+
+// Gives the file its name, in place of another one only when that is wanted.
+bool Rename(std::string const& from, std::string const& to, bool overwrites) {
+  if (overwrites) return std::rename(from.c_str(), to.c_str()) == 0;
+  if (::renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0) return true;
+  if (errno != EINVAL) return false;  // that a file system knows no such renaming
+  return !fs::exists(to) && std::rename(from.c_str(), to.c_str()) == 0;
+}
+
+bool MakeEmptyFile(std::string const& path) {
+  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL, 0666));
+  return static_cast<bool>(file);
+}
+
+// Whether more could be written to the file. False, with errno set, on a full disk.
+bool CanGrow(std::string const& path) {
+  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_APPEND));
+  if (!file) return errno == ENOENT;
+  struct stat before {};
+  ::fstat(file.Get(), &before);
+  off_t const size = ::lseek(file.Get(), 0, SEEK_END);
+  bool const isWritten = WriteWhole(file.Get(), std::string(4096, '\0'));
+  int const error = errno;
+  if (::ftruncate(file.Get(), size) != 0) return false;
+  timespec const times[] = {before.st_atim, before.st_mtim};
+  ::futimens(file.Get(), times);  // which may tell where it came from (MarkForResuming)
+  errno = error;
+  return isWritten;
+}
+
+// Makes a failed transfer one of the local disk, when that is the cause.
+void BlameTheDisk(TOutcome& outcome, std::string const& part) {
+  if (outcome.fExit != kExitNothing || CanGrow(part)) return;
+  outcome.fExit = kExitNotWritten;
+  outcome.fReason = ReasonOf(errno);
+}
+
+// What there is of a file that did not arrive.
+std::string PartText(std::string const& part) {
+  std::error_code absent;
+  std::uintmax_t const size = fs::file_size(part, absent);
+  return absent ? "; nothing arrived" : "; the " + SizeText(size) + " that arrived are in " + Printable(part);
+}
+
+bool IsRegularFile(std::string const& file) {
+  struct stat status {};
+  return ::lstat(file.c_str(), &status) == 0 && S_ISREG(status.st_mode);
+}
+
+// Whether a part could be written; one that an earlier transfer left stays. False, with errno set, when not.
+bool CanMakePart(std::string const& part, bool isThere) {
+  if (isThere) return static_cast<bool>(TDescriptor(::open(part.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC)));
+  if (::unlink(part.c_str()) != 0 && errno != ENOENT) return false;
+  if (!MakeEmptyFile(part)) return false;
+  ::unlink(part.c_str());
+  return true;
+}
+
+TTransferred BrokenOff(TTransferred transferred, bool wasThere, TTransferState const& state, TTransferOptions const& options) {
+  std::string const& part = transferred.fFile;
+  if (transferred.fOutcome.fStatus == kZEPStatusAlreadyExists)
+    return Failed(transferred, kExitNotWritten, "another program has made this file meanwhile");
+  if (state.fIsTooLarge) {
+    transferred.fOutcome.fReason = "the file is larger than " + ExactSizeText(options.fMostBytes) + "; --max-size allows more";
+    bool const isKept = wasThere || (::unlink(part.c_str()) != 0 && errno != ENOENT);
+    if (!isKept) return transferred;
+  } else {
+    BlameTheDisk(transferred.fOutcome, part);
+  }
+  MarkForResuming(part, state);
+  transferred.fOutcome.fReason += PartText(part);
+  return transferred;
+}
+
+// Gives the part, all of which has arrived, the name of the file.
+TTransferred Completed(TTransferred transferred, std::string const& file, bool overwrites) {
+  std::string const& part = transferred.fFile;
+  // An empty file does not arrive at all.
+  if (!fs::exists(part) && !MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
+  transferred.fBytes = fs::file_size(part);
+  transferred.fSha256 = Sha256Of(part);
+  if (!Rename(part, file, overwrites))
+    return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + ReasonOf(errno));
+  transferred.fFile = file;
+  return transferred;
+}
+
+}  // namespace
+
+void AddTransferOptions(CLI::App& command, TTransferOptions& options) {
+  command.add_flag("--quiet", options.fQuiet, "No progress, and no word when all went well");
+  command
+      .add_option("--stall", options.fStallSeconds,
+                  "The longest standstill allowed, in seconds (60); 0 waits for ever. What is sent counts as moved when\n"
+                  "it is read: the last few MiB must reach a slow server within that time")
+      ->check(CLI::Range(0, 86400));
+  command.add_option("--netrc", options.fNetrc, "The file with users and passwords ($NETRC, else ~/.netrc)");
+}
+
+void AddSizeOption(CLI::App& command, std::string const& name, std::uint64_t& bytes, std::string const& description) {
+  CLI::Validator const check([&bytes](std::string& text) { return WhyNoSize(text, bytes); }, "SIZE, such as 500K, 2M or 1G");
+  command
+      .add_option_function<std::string>(
+          name, [](std::string const&) {}, description)
+      ->check(check)
+      ->type_name("");
+}
+
+std::string TransferHelp() {
+  return "Passwords come from the URL (which other users may see in the list of processes), from netrc, or from a prompt.\n"
+         "The key of an SFTP server is not checked: who stands in its place gets the password.\n"
+         "In the path of a URL blanks and the like may be written as they are; \"%20\" stays what it is.\n"
+         "Exit status: 0 when all went well, 1 when the server refused it or the transfer broke off, 64 for wrong usage,\n"
+         "66 when the file to be sent cannot be read, 68 when the host is unknown or nobody answers, 69 without libcurl,\n"
+         "73 when the local file exists or cannot be written, 75 when nothing moved for too long.";
+}
+
+bool IsUrl(std::string const& text) { return text.find("://") != text.npos; }
+
+TTarget TargetOf(std::string const& text, bool bySftp) {
+  TTarget target{RemoteOf(text, bySftp ? "sftp" : "ftp"), !IsUrl(text)};
+  if (target.fRemote.fScheme != "ftp" && target.fRemote.fScheme != "sftp") throw TWrongUsage("only ftp:// and sftp:// are known");
+  if (target.fIsHost && !target.fRemote.fPath.empty()) throw TWrongUsage("a host has no path; write a URL");
+  return target;
+}
+
+TTransferred SendFile(std::string const& file, TTarget target, std::string const& name, TTransferOptions const& options) {
+  AddName(target.fRemote, name.empty() ? fs::path(file).filename().string() : name);
+  TTransferred transferred = TransferOf(PlaceOf(target), file);
+  struct stat before;
+  std::string const why = WhyNotReadable(file, before);
+  if (!why.empty()) return Failed(transferred, kExitNoInput, why);
+  transferred.fBytes = static_cast<std::uint64_t>(before.st_size);
+
+  FindPassword(target.fRemote, options.fNetrc);
+  TRemote const place = PlaceOf(target);
+  transferred.fUrl = ShownUrlOf(place);
+  TSharedTransferState const state;
+  int const cleanUpSeconds = CleanUpSecondsOf(options);
+  TUploadNames const names = NamesForUpload(place);
+  transferred.fOutcome =
+      Transfer([&] { return Upload(place, names, file, cleanUpSeconds, *state); }, *state, transferred.fBytes, options);
+  EExitStatus const exit = transferred.fOutcome.fExit;
+  bool const wasEnded = exit == kExitStalled || exit >= kExitHangUp;
+  if (wasEnded && (state->fLeft & (kLeftTemporary | kLeftAtPlace))) CleanUp(place, names, cleanUpSeconds, *state);
+  ExplainNoConnection(transferred.fOutcome, place);
+  ExplainUpload(transferred, place, names, *state);
+  if (exit != kExitComplete) return transferred;
+  bool const isAsBefore = IsAsBefore(file, before);
+  if (isAsBefore) transferred.fSha256 = Sha256Of(file);
+  if (!isAsBefore || !IsAsBefore(file, before)) return Failed(transferred, kExitPartial, "the file changed while it was sent");
+  return transferred;
+}
+
+TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, TTransferOptions const& options) {
+  std::string const part = file + ".part";
+  TTransferred transferred = TransferOf(remote, part);
+  FindPassword(remote, options.fNetrc);
+  transferred.fUrl = ShownUrlOf(remote);
+  TLockFile const lock(part + ".lock");
+  if (!lock.WhyNotHad().empty()) return Failed(transferred, kExitNotWritten, lock.WhyNotHad());
+  bool const isThere = IsRegularFile(part);
+  if (!CanMakePart(part, isThere)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
+  TSharedTransferState const state;
+  std::uint64_t const most = options.fMostBytes;
+  transferred.fOutcome = Transfer([&] { return Download(remote, part, isThere, most, *state); }, *state, 0, options);
+  ExplainNoConnection(transferred.fOutcome, remote);
+  if (transferred.fOutcome.fExit != kExitComplete) return BrokenOff(transferred, isThere, *state, options);
+  return Completed(transferred, file, overwrites);
+}
+
+void WarnOfLeft(TTransferred const& transferred) {
+  bool const isComplete = transferred.fOutcome.fExit == kExitComplete;  // else the reason tells
+  if (!isComplete || transferred.fLeftOnServer.empty()) return;
+  std::cerr << "zep: warning: the server did not remove " << JoinedByAnd(transferred.fLeftOnServer)
+            << ", which the upload needed for a while\n";
+}
+
+TJson DocumentOf(TTransferred const& transferred, std::string const& command) {
+  bool const isComplete = transferred.fOutcome.fExit == kExitComplete;
+  TJson document = DocumentHead(command, transferred.fOutcome.fExit, transferred.fOutcome.fReason);
+  document["url"] = transferred.fUrl;
+  document["file"] = MessageWithoutSecrets(transferred.fFile);
+  document["bytes"] = isComplete ? TJson(transferred.fBytes) : TJson(nullptr);
+  document["sha256"] = isComplete ? TJson(transferred.fSha256) : TJson(nullptr);
+  if (command == "zep send") document["leftOnServer"] = transferred.fLeftOnServer;
+  return document;
+}
+
+int TellOf(TTransferred const& transferred, std::string const& command, bool asJson, TTransferOptions const& options) {
+  TOutcome const& outcome = transferred.fOutcome;
+  bool const isComplete = outcome.fExit == kExitComplete;
+  if (asJson) {
+    WriteOutput(AsText(DocumentOf(transferred, command)));
+  } else if (isComplete && !options.fQuiet) {
+    WriteMessage(transferred.fUrl + ", " + Printable(transferred.fFile) + ": " + std::to_string(transferred.fBytes) +
+                 " bytes, SHA-256 " + transferred.fSha256 + "\n");
+  }
+  WarnOfLeft(transferred);
+  if (!isComplete)
+    std::cerr << "zep: " << transferred.fUrl << ", " << Printable(transferred.fFile) << ": " << outcome.fReason << "\n";
+  return outcome.fExit;
+}
+
+}  // namespace NQRVZEP20::zep

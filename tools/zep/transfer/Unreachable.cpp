@@ -1,0 +1,70 @@
+#include "tools/zep/transfer/Unreachable.h"
+
+#include "tools/zep/processes/Descriptor.h"
+
+#include <netdb.h>
+#include <poll.h>
+#include <sys/socket.h>
+
+#include <cerrno>
+#include <memory>
+#include <system_error>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+using TAddresses = std::unique_ptr<addrinfo, void (*)(addrinfo*)>;
+
+// "[::1]" without its brackets.
+std::string WithoutBrackets(std::string const& host) {
+  bool const isBracketed = host.size() > 2 && host.front() == '[' && host.back() == ']';
+  return isBracketed ? host.substr(1, host.size() - 2) : host;
+}
+
+// Returns 0 or the error of getaddrinfo.
+int Resolve(std::string const& host, std::string const& port, TAddresses& addresses) {
+  addrinfo wanted{}, *found = nullptr;
+  wanted.ai_socktype = SOCK_STREAM;
+  int const error = ::getaddrinfo(WithoutBrackets(host).c_str(), port.c_str(), &wanted, &found);
+  if (error == 0) addresses.reset(found);
+  return error;
+}
+
+// The errno of connecting; 0 when it succeeds.
+int ErrorOfConnecting(addrinfo const& address, int timeoutSeconds) {
+  TDescriptor const socket(::socket(address.ai_family, SOCK_STREAM | SOCK_NONBLOCK | SOCK_CLOEXEC, 0));
+  if (!socket) return errno;
+  if (::connect(socket.Get(), address.ai_addr, address.ai_addrlen) == 0) return 0;
+  if (errno != EINPROGRESS) return errno;
+  pollfd waiting{socket.Get(), POLLOUT, 0};
+  if (::poll(&waiting, 1, timeoutSeconds * 1000) <= 0) return ETIMEDOUT;
+  int error = 0;
+  socklen_t size = sizeof error;
+  return ::getsockopt(socket.Get(), SOL_SOCKET, SO_ERROR, &error, &size) == 0 ? error : errno;
+}
+
+std::string ReasonOf(int error, std::string const& host, std::string const& port) {
+  if (error == ECONNREFUSED)
+    return host + " refuses connections to port " + port + "; is the server running, and the port right?";
+  if (error == ETIMEDOUT)
+    return host + " does not answer at port " + port + "; is it on, and does a firewall let this port through?";
+  return host + ", port " + port + ": " + std::generic_category().message(error);
+}
+
+}  // namespace
+
+std::string WhyUnreachable(std::string const& host, std::string const& port, int timeoutSeconds) {
+  TAddresses addresses(nullptr, ::freeaddrinfo);
+  int const unknown = Resolve(host, port, addresses);
+  if (unknown == EAI_AGAIN) return "the host name " + host + " could not be looked up: no name server answers";
+  if (unknown != 0) return "the host name " + host + " has no address; is it spelled right? (" + ::gai_strerror(unknown) + ")";
+  int error = 0;
+  for (addrinfo const* address = addresses.get(); address != nullptr; address = address->ai_next) {
+    error = ErrorOfConnecting(*address, timeoutSeconds);
+    if (error == 0) return "";
+  }
+  return ReasonOf(error, host, port);
+}
+
+}  // namespace NQRVZEP20::zep

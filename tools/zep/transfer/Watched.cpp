@@ -1,0 +1,151 @@
+#include "tools/zep/transfer/Watched.h"
+
+#include "ILogger.h"
+#include "TRootObject.h"
+#include "TZEPException.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/processes/Interrupts.h"
+#include "tools/zep/processes/TChildProcess.h"
+#include "tools/zep/secrets/Secrets.h"
+
+#include <fcntl.h>
+#include <poll.h>
+#include <signal.h>
+#include <sys/resource.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <chrono>
+#include <filesystem>
+#include <system_error>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+namespace fs = std::filesystem;
+using TClock = std::chrono::steady_clock;
+
+constexpr int kLookEveryMilliseconds = 100;
+
+EExitStatus ExitStatusOf(TZEPStatusCode const& status) {
+  if (status == kZEPStatusOK) return kExitComplete;
+  if (status == kZEPStatusConnectionFailed) return kExitNoConnection;
+  if (status == kZEPStatusLibCurlFailure) return kExitNoLibrary;
+  return kExitNothing;
+}
+
+// ---- In the child ----
+
+// What the library logged last as an error, less the name of the operation.
+std::string LoggedReason() {
+  ILogger* const logger = TRootObject::GetCoreLogger();
+  if (logger == nullptr || logger->GetLog().empty()) return "";
+  std::string const& message = logger->GetLog().back().fMessage;
+  std::size_t const name = message.find(": ");
+  return message.rfind("TOSSpecific|", 0) == 0 && name != message.npos ? message.substr(name + 2) : message;
+}
+
+// The report of the child: the status as a number, a blank, and the reason.
+std::string ReportOf(std::function<TZEPStatusCode()> const& transfer) {
+  TZEPStatusCode status = kZEPStatusFail;
+  std::string reason;
+  try {
+    status = transfer();
+  } catch (TZEPException const& failure) {
+    status = failure.GetStatusCode();
+  } catch (std::exception const& failure) {
+    reason = failure.what();
+  }
+  if (reason.empty() && status != kZEPStatusOK) reason = LoggedReason();
+  return std::to_string(status.GetCode()) + " " + reason;
+}
+
+// A file that would become larger breaks off with an error of writing.
+void LimitFiles(std::uint64_t most) {
+  rlimit const limit{most, most};
+  ::signal(SIGXFSZ, SIG_IGN);
+  ::setrlimit(RLIMIT_FSIZE, &limit);
+}
+
+std::string ReportOfSilent(std::function<TZEPStatusCode()> const& transfer, std::uint64_t mostBytes) {
+  if (mostBytes > 0) LimitFiles(mostBytes);
+  TDescriptor const nowhere(::open("/dev/null", O_RDWR));
+  ::dup2(nowhere.Get(), STDIN_FILENO);
+  ::dup2(nowhere.Get(), STDOUT_FILENO);
+  if (ILogger* const logger = TRootObject::GetCoreLogger()) logger->ClearLog();
+  return ReportOf(transfer);
+}
+
+// ---- In zep ----
+
+std::uint64_t BytesMoved(TWatch const& watch) {
+  if (watch.fMoved != nullptr) return *watch.fMoved;
+  std::error_code absent;
+  std::uintmax_t const size = fs::file_size(watch.fFile, absent);
+  return absent ? 0 : size;
+}
+
+// Where libcurl itself is missing, and not a function of it, the package that has it is named.
+std::string RemedyFor(std::string const& reason) {
+  bool const isMissing = reason.find("Error opening curl library: ") != reason.npos;
+  return isMissing ? "; install the package libcurl4" : "";
+}
+
+bool EndsWith(std::string const& text, std::string const& end) {
+  return text.size() >= end.size() && text.compare(text.size() - end.size(), end.size(), end) == 0;
+}
+
+TOutcome OutcomeOf(std::string const& report) {
+  std::size_t const blank = report.find(' ');
+  if (blank == report.npos) return {kZEPStatusFail, kExitNothing, "the process of the transfer died"};
+  TZEPStatusCode const status(static_cast<EZEPStatusCode>(std::stoi(report.substr(0, blank))));
+  if (status == kZEPStatusOK) return {status, kExitComplete, ""};
+  std::string reason = Printable(MessageWithoutSecrets(report.substr(blank + 1)));
+  if (EndsWith(reason, ": ")) reason += "libcurl does not tell why";
+  reason += RemedyFor(reason);
+  return {status, ExitStatusOf(status), reason.empty() ? status.TranslateStatusCode() : reason};
+}
+
+TOutcome Stalled(TWatch const& watch) {
+  return {kZEPStatusTransferFailure, kExitStalled, "nothing moved for " + std::to_string(watch.fStallSeconds) + " s"};
+}
+
+TOutcome Interrupted() {
+  int const signal = PendingInterrupt();
+  EExitStatus const exit = signal == SIGHUP ? kExitHangUp : signal == SIGINT ? kExitInterrupt : kExitTermination;
+  return {kZEPStatusFail, exit, "interrupted"};
+}
+
+// Reads the report until the child is done; false when it stood still for too long, or when zep is interrupted.
+bool ReadReport(TChildProcess& child, TWatch const& watch, std::string& report) {
+  std::uint64_t last = BytesMoved(watch);
+  TClock::time_point lastMoved = TClock::now();
+  pollfd waiting{child.Output(), POLLIN, 0};
+  while (true) {
+    if (PendingInterrupt() != 0) return false;
+    if (::poll(&waiting, 1, kLookEveryMilliseconds) > 0) {
+      if (!child.Read(report)) return true;
+      continue;
+    }
+    std::uint64_t const now = BytesMoved(watch);
+    if (watch.fShowProgress) watch.fShowProgress(now);
+    if (now != last) lastMoved = TClock::now();
+    last = now;
+    if (watch.fStallSeconds > 0 && TClock::now() - lastMoved > std::chrono::seconds(watch.fStallSeconds)) return false;
+  }
+}
+
+}  // namespace
+
+TOutcome RunWatched(std::function<TZEPStatusCode()> const& transfer, TWatch const& watch) {
+  TChildProcess child([&] { return ReportOfSilent(transfer, watch.fMostBytes); }, SIGKILL);  // a transfer does not outlive zep
+  std::string report;
+  if (!ReadReport(child, watch, report)) return PendingInterrupt() != 0 ? Interrupted() : Stalled(watch);
+  child.End();
+  if (PendingInterrupt() != 0) return Interrupted();  // which may have ended the process as well
+  return OutcomeOf(report);
+}
+
+}  // namespace NQRVZEP20::zep

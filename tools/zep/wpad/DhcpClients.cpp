@@ -1,0 +1,80 @@
+#include "tools/zep/wpad/DhcpClients.h"
+
+#include "TOSSpecific.h"
+
+#include <algorithm>
+#include <fstream>
+#include <iterator>
+#include <optional>
+#include <sstream>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+constexpr char const* kName = "dhclient";
+constexpr int kSilenceSeconds = 300;
+
+// As the library reads it; empty when the line begins with none.
+std::string ProcessNumberOf(std::string const& line) {
+  std::size_t const start = std::min(line.find_first_not_of(' '), line.size());
+  return line.substr(start, std::min(line.find_first_not_of("0123456789", start), line.size()) - start);
+}
+
+// Whether a process may have it, as /proc writes it. "kill" understands more: it ends process 7 for "007".
+bool IsPlainNumber(std::string const& number) {
+  constexpr std::size_t kMostDigits = 7;  // the kernel's largest is 4194304
+  return number.front() != '0' && number.size() <= kMostDigits;
+}
+
+// What the process calls itself; nothing where there is none of that number.
+std::optional<std::string> NameOfProcess(std::string const& number) {
+  std::ifstream file("/proc/" + number + "/comm", std::ios::binary);
+  if (!file) return std::nullopt;
+  std::string name((std::istreambuf_iterator<char>(file)), std::istreambuf_iterator<char>());
+  if (!name.empty() && name.back() == '\n') name.pop_back();
+  return name;
+}
+
+}  // namespace
+
+std::vector<std::string> DhcpClientLines() {
+  std::istringstream processes(TOSSpecific::SpawnProcess("ps", {"-e"}, kSilenceSeconds));
+  std::vector<std::string> lines;
+  for (std::string line; std::getline(processes, line);)
+    if (line.find(kName) != line.npos) lines.push_back(line);
+  return lines;
+}
+
+namespace {
+
+// By its number: the rest of a forged line may change each time.
+bool IsStillListed(std::string const& number) {
+  std::vector<std::string> const lines = DhcpClientLines();
+  return std::any_of(lines.begin(), lines.end(), [&](std::string const& line) { return ProcessNumberOf(line) == number; });
+}
+
+// Why the process of that number is not to be ended; empty when it is, or when there is nothing to end.
+std::string WhyNotNumber(std::string const& number) {
+  if (number.empty()) return "";
+  if (!IsPlainNumber(number)) return number + " is not the number of a process";
+  std::optional<std::string> const name = NameOfProcess(number);
+  if (name) return name->find(kName) != name->npos ? "" : "process " + number + " is \"" + *name + "\"";
+  return IsStillListed(number) ? "there is no process " + number : "";  // else it has ended meanwhile
+}
+
+}  // namespace
+
+std::string WhyNotToBeEnded(std::vector<std::string> const& lines) {
+  for (std::string const& line : lines) {
+    std::string const why = WhyNotNumber(ProcessNumberOf(line));
+    if (why.empty()) continue;
+    return "the line \"" + line + "\" of \"ps -e\" is wrong: " + why +
+           ". Nothing was ended. Another process may forge the line by a line break in its name: compare \"ps -e\" with the "
+           "names "
+           "in /proc/PID/comm and end that process. --no-stop leaves the DHCP clients alone";
+  }
+  return "";
+}
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,83 @@
+#include "tools/zep/wpad/PacFile.h"
+
+#include "tools/zep/output/Text.h"
+#include "tools/zep/transfer/Curl.h"
+
+#include <strings.h>
+
+#include <array>
+#include <cstring>
+#include <memory>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+constexpr std::size_t kMostBytes = 1 << 20;
+
+// What has come, and whether that was too much.
+struct TPage {
+  std::string& fText;
+  bool fIsTooLong = false;
+};
+
+// libcurl's write callback. What is too long is refused, which ends the transfer.
+std::size_t Append(char const* bytes, std::size_t size, std::size_t count, void* context) {
+  TPage& page = *static_cast<TPage*>(context);
+  page.fIsTooLong = page.fText.size() + size * count > kMostBytes;
+  if (page.fIsTooLong) return 0;
+  page.fText.append(bytes, size * count);
+  return size * count;
+}
+
+// Empty, or why the file could not be had.
+std::string Transfer(TCurl const& curl, std::string const& url, std::string& text) {
+  std::unique_ptr<CURL, decltype(curl_easy_cleanup)*> const transfer(curl.fInit(), curl.fCleanup);
+  if (!transfer) return "libcurl does not start";
+  std::array<char, CURL_ERROR_SIZE> error{};
+  CURL* const handle = transfer.get();
+  curl.fSetOption(handle, CURLOPT_ERRORBUFFER, error.data());
+  curl.fSetOption(handle, CURLOPT_URL, url.c_str());
+  curl.fSetOption(handle, CURLOPT_PROTOCOLS, long{CURLPROTO_HTTP});
+  curl.fSetOption(handle, CURLOPT_REDIR_PROTOCOLS, long{CURLPROTO_HTTP});
+  curl.fSetOption(handle, CURLOPT_FOLLOWLOCATION, 1L);
+  curl.fSetOption(handle, CURLOPT_MAXREDIRS, 5L);
+  curl.fSetOption(handle, CURLOPT_NOPROXY, "*");
+  curl.fSetOption(handle, CURLOPT_FAILONERROR, 1L);
+  curl.fSetOption(handle, CURLOPT_CONNECTTIMEOUT, 10L);
+  curl.fSetOption(handle, CURLOPT_TIMEOUT, 30L);
+  curl.fSetOption(handle, CURLOPT_NOSIGNAL, 1L);
+  curl.fSetOption(handle, CURLOPT_WRITEFUNCTION, &Append);
+  TPage page{text};
+  curl.fSetOption(handle, CURLOPT_WRITEDATA, &page);
+  CURLcode const code = curl.fPerform(handle);
+  if (code == CURLE_OK) return "";
+  if (page.fIsTooLong) return "it is larger than " + ExactSizeText(kMostBytes);
+  return error[0] != '\0' ? error.data() : "libcurl ends with code " + std::to_string(code);
+}
+
+bool IsPlainHttp(std::string const& url) { return ::strncasecmp(url.c_str(), "http://", 7) == 0; }
+
+}  // namespace
+
+TPacFile FetchPacFile(std::string const& url) {
+  TPacFile file;
+  if (!IsPlainHttp(url)) {
+    file.fFailure = "only files of plain HTTP are fetched";
+    return file;
+  }
+  TCurl curl;
+  if (!Load(curl, file.fFailure)) {
+    file.fFailure = "libcurl cannot be loaded: " + file.fFailure + (curl.fLibrary ? "" : "; install the package libcurl4");
+    return file;
+  }
+  if (curl.fGlobalInit(CURL_GLOBAL_ALL) != CURLE_OK) {
+    file.fFailure = "libcurl does not start";
+    return file;
+  }
+  file.fFailure = Transfer(curl, url, file.fText);
+  curl.fGlobalCleanup();
+  return file;
+}
+
+}  // namespace NQRVZEP20::zep
