@@ -12,7 +12,7 @@ int main() {
     auto const provider = TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Host");
     std::cout << TCIMSchemaHelper::GetMTM(provider->GetNamespace(TCIMContext())) << "\n";
   } catch (TZEPException const& failure) {
-    std::cerr << failure.what() << "\n";  // such as kZEPStatusInvalidFormat: the product name tells none
+    std::cerr << failure.what() << "\n";  // such as kZEPStatusInvalidFormat: the product name has no machine type
     return 1;
   }
 }

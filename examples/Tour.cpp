@@ -1,4 +1,4 @@
-// What docs/tour.md shows, as one program. It prints what the page says that it prints.
+// The program that docs/tour.md shows, with its output.
 
 #include <zepcore.h>
 
@@ -16,20 +16,20 @@ void HoldValues() {
   std::cout << slots.GetType().ToString() << " " << slots.ToString() << ", " << slots.ToString(16) << "\n";
   std::cout << name.ToString() << " turns at " << speeds.ToString() << "\n";
 
-  unsigned int const count = slots;  // exactly this type: an unsigned short would throw kZEPStatusTypeMismatch
+  unsigned int const count = slots;  // exactly this type; an unsigned short throws kZEPStatusTypeMismatch
   std::string text = "17";
   TCIMValue const read(TCIMValue::TCIMType::kCIMTypeUint32, text, nullptr);
   std::cout << count << (slots < read ? " is less than " : " is not less than ") << read.ToString() << "\n";
 }
 
-void TellTheTime() {
+void AddTimes() {
   TCIMDateTime const start("20240303090507.000000+060");
   TCIMDateTime const anHourAndAHalf(0, 1, 30, 0, 0);
   std::cout << (start + anHourAndAHalf).ToString() << " is " << anHourAndAHalf.ToUIString() << "later\n";
 }
 
 boost::shared_ptr<ICIMNamespace> LoadProvider() {
-  TOSSpecific::LoadNSPLibrary("Host");  // libHost.nsp.so, beside libzepcore.so; it registers itself
+  TOSSpecific::LoadNSPLibrary("Host");  // libHost.nsp.so, in the directory of libzepcore.so
   return TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Host")->GetNamespace(TCIMContext());
 }
 
@@ -40,7 +40,7 @@ void WalkInstances(boost::shared_ptr<ICIMNamespace> const& ns) {
   for (auto const& module : modules) {
     TCIMValue const capacity = module->GetProperty("Capacity", TCIMContext())->GetValue(TCIMContext());
     std::cout << module->GetPath(TCIMContext()).GetPath() << ": " << (capacity.IsNull() ? "?" : capacity.ToString()) << "\n";
-    return;  // one is enough here
+    return;  // the first is enough here
   }
 }
 
@@ -50,12 +50,12 @@ void FollowAPath(boost::shared_ptr<ICIMNamespace> const& ns) {
       ->EnumerateInstances(TAddToVectorCallback<ICIMInstance>(systems), TCIMContext());
   std::string const path = systems.at(0)->GetPath(TCIMContext()).GetPath();
 
-  TCIMReference const reference(ns, "root/host:" + path, TCIMContext());  // keys are read behind a namespace prefix only
+  TCIMReference const reference(ns, "root/host:" + path, TCIMContext());  // keys are read only after a namespace prefix
   bool const isTheSame = reference.GetCIMElement(false) == systems[0];
   std::cout << reference.GetClassName() << (isTheSame ? ": the same object\n" : ": another object\n");
 }
 
-void AskForTheIdentity(boost::shared_ptr<ICIMNamespace> const& ns) {
+void PrintIdentity(boost::shared_ptr<ICIMNamespace> const& ns) {
   std::cout << TCIMSchemaHelper::GetMTM(ns) << ", " << TCIMSchemaHelper::GetSerialNumber(ns, TCIMContext()) << "\n";
 }
 
@@ -67,11 +67,11 @@ void RunACommand() {
 
 void KeepALog() {
   TLogger::SetLogThreshold(ILogger::kLogDebug);
-  TRootObject::GetCoreLogger()->SetLogFilename("tour.log");  // of this thread
+  TRootObject::GetCoreLogger()->SetLogFilename("tour.log");  // for this thread
   TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogWarning, "the fan turns slowly");
 }
 
-void MeetAnError(boost::shared_ptr<ICIMNamespace> const& ns) {
+void HandleError(boost::shared_ptr<ICIMNamespace> const& ns) {
   try {
     TCIMReference(ns, "root/host:X_Nothing.Id=\"1\"", TCIMContext());
   } catch (TZEPException const& failure) {
@@ -84,14 +84,14 @@ void MeetAnError(boost::shared_ptr<ICIMNamespace> const& ns) {
 int main() {
   try {
     HoldValues();
-    TellTheTime();
+    AddTimes();
     auto const ns = LoadProvider();
     WalkInstances(ns);
     FollowAPath(ns);
-    AskForTheIdentity(ns);
+    PrintIdentity(ns);
     RunACommand();
     KeepALog();
-    MeetAnError(ns);
+    HandleError(ns);
     return 0;
   } catch (TZEPException const& failure) {
     std::cerr << failure.what() << "\n";
