@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Compares reading a configuration file of 100,000 lines with GLib's GKeyFile, for sorted and for shuffled keys.
 
 #include "TConfig.h"

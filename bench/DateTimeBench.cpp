@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Compares datetime text with its peers: reading with GLib's GDateTime, printing with snprintf. Each round uses the same
 // points in time, in winter and in summer.
 

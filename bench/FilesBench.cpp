@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Compares file operations with GLib, Qt (where it is installed), the standard library and cp: reading a large file and a
 // pseudo-file, copying a large file and a tree, listing a directory.
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Compares reading the identity of a machine (type, name, model and serial number) from the bundled sample, an SMBIOS table
 // of 7 KB, with what a script would do: run dmidecode for the serial number alone.
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Compares zep with ipmitool, each run as a program, for reading the identity of a remote server from a simulated
 // controller; a query of a hundred controllers with a query of the slowest one alone; and the checksum of a message with a
 // plain loop. Needs root, to create its own network namespace.

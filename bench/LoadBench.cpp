@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Compares loading the core library with loading an empty one. Each load runs in a fresh process, which itself measures its
 // call of dlopen.
 

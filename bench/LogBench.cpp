@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Compares log entries with spdlog's: one that the threshold drops, and one that is written to a file and flushed. Both
 // loggers are reached as callers reach them, through the accessor function.
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Loads the DMTF CIM schema from MOF and copies it. Loading is compared with a loop that only splits the text into tokens,
 // copying with a loop that makes the same calls of the interfaces. The schema may not be distributed with the sources: its
 // archive is taken from the folder ZEP_DMTF_SCHEMA, or from shared/data/dmtf-schema beside the source tree. The times are

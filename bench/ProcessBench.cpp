@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Compares child processes with those of GLib, Boost.Process and popen: running one that prints nothing, also from a parent
 // that holds much memory, and capturing 10 MB of output.
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Compares object paths with hand-written loops over strings, which know neither classes nor types. The calls that a
 // reference makes to its namespace are measured separately, because the loops have no counterpart.
 

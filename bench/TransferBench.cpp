@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Compares transferring a file of 1 GiB to and from a server on loopback with the curl program, which uses the same libcurl.
 // A download is slower for two reasons: the curl program uses larger chunks (100 KiB instead of 16), and the library's write
 // callback opens and closes its file for each chunk. The benchmark with a file that stays open shows the first reason alone.

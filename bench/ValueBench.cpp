@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Compares values with their peers: making and copying with boost::any, printing with std::to_chars, Poco and fmt, reading
 // with a standard stream.
 

@@ -1,3 +1,5 @@
+# SPDX-License-Identifier: Apache-2.0
+
 # Settings for everything that is compiled here (warnings, sanitizers, output directories), and the functions that define
 # rooms, platform libraries, plug-ins and tests.
 

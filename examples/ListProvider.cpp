@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Loads provider plug-ins by their paths and prints every instance that they provide:
 //
 //   ListProvider examples/libClock.nsp.so

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Asks the host provider for the machine type and model of this machine.
 
 #include <zepcore.h>

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The program that docs/tour.md shows, with its output.
 
 #include <zepcore.h>

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Reads any text as a datetime. The text must be refused with kZEPStatusInvalidDateTime, or print as it was read.
 
 #include "TCIMDateTime.h"

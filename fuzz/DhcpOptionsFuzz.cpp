@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Reads any bytes as the options of a DHCP reply. The area is at the end of a page, before an unreadable page, and a value
 // that is found must be that of an option completely inside the area.
 

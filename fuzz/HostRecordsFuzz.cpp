@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Reads any bytes as an SMBIOS structure of every type that the host provider knows. Each record must have its number of
 // properties, and each property a value or a reason. The same bytes are also read as an SMBIOS entry point.
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Packets from the network for libipmiClient.so: as they come, and ones that are right, signatures and checksums too, up to a
 // few changed bytes. A packet that is right is read, and of a signed one nothing else is ever read.
 
@@ -14,7 +16,7 @@ using namespace ipmi;
 constexpr std::uint32_t kClientsId = 0x11223344, kControllersId = 0x55667788;
 constexpr TCipherSuite kSuite = {IPMI_AUTHENTICATION_ALGORITHM_RAKP_HMAC_SHA1, IPMI_INTEGRITY_ALGORITHM_HMAC_SHA1_96,
                                  IPMI_CONFIDENTIALITY_ALGORITHM_AES_CBC_128};
-const std::string kPassword = "zeppass1";
+std::string const kPassword = "zeppass1";
 
 TKeys Keys() {
   TKeys keys{};
@@ -61,16 +63,16 @@ void ReadChanged(IEnvelope& controllers, IEnvelope const& clients, TMessage cons
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
-  static const int isReady = ::ipmi_rmcpplus_init();
+  static int const isReady = ::ipmi_rmcpplus_init();
   Require(isReady == 0);
   if (size < 6) return 0;
   // Which packet, how many changes, and the message.
-  const std::size_t changes = std::min<std::size_t>(data[1] % 8u * 2, size - 6);
-  const TByteVector changed(data + 5, data + 5 + changes);
+  std::size_t const changes = std::min<std::size_t>(data[1] % 8u * 2, size - 6);
+  TByteVector const changed(data + 5, data + 5 + changes);
   TByteVector rest(data + 5 + changes, data + size);
   if (data[0] % 4 == 0) ReadAsItCame(rest);
   rest.resize(std::min<std::size_t>(rest.size(), 200));
-  const TMessage answer = {static_cast<unsigned char>(data[2] % 7 * 2 + 1), static_cast<unsigned char>(data[3] & 0x3F), data[4],
+  TMessage const answer = {static_cast<unsigned char>(data[2] % 7 * 2 + 1), static_cast<unsigned char>(data[3] & 0x3F), data[4],
                            rest};
   if (data[0] % 4 == 1) {
     TEnvelope15 controllers(Session15(IPMI_AUTHENTICATION_TYPE_NONE)), clients(Session15(IPMI_AUTHENTICATION_TYPE_NONE));

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Reads any bytes as hwinfo's output, as a SCSI address and as the kernel's list of USB devices.
 
 #include "fuzz/Require.h"

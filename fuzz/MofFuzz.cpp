@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Reads any text as MOF. The text must be refused with a position, or, once written as MOF, read back as the same.
 
 #include "providers/memory/TMemoryNamespace.h"

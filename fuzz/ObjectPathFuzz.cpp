@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Reads any text as an object path. The text must be refused in one of the expected ways, or the path must print as a text
 // that, with a namespace prefix, reads back as an equal path. A path with references among its keys is only printed: a
 // printed reference lacks the prefix that reading it needs.

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Reads any bytes as an SMBIOS table: with the parser, with the C functions of libsmbios.so on a file in memory, and with
 // the core's readers of structures. Every structure must be complete and inside the table.
 
@@ -24,7 +26,7 @@ using TCounts = std::array<int, 256>;  // structures by type
 
 // Counts the structures. Each must be complete and directly follow the one before.
 TCounts CountsInTable(std::string_view file) {
-  const std::string_view table = smbios::DmiTableIn(file);
+  std::string_view const table = smbios::DmiTableIn(file);
   smbios::TStructureReader reader(table);
   char const* end = table.data();
   TCounts counts = {};
@@ -39,7 +41,7 @@ TCounts CountsInTable(std::string_view file) {
 }
 
 void ReadIdentity(std::string_view structure) {
-  const TStructureStrings strings(structure);
+  TStructureStrings const strings(structure);
   TMachineIdentity identity;
   ReadProductDescription(strings.NamedAt(5).value_or(""), identity);
   Require(identity.type.size() == 4);
@@ -50,7 +52,7 @@ void ReadBiosVersion(std::string_view structure) {
   if (structure.size() < 6) return;
   std::string set(structure.substr(4));
   std::string output(set.size(), '\0');
-  const int found = TOSSpecific::getBIDString(set.data(), output.data(), static_cast<int>(set.size()), structure[5]);
+  int const found = TOSSpecific::getBIDString(set.data(), output.data(), static_cast<int>(set.size()), structure[5]);
   Require(found == 0 || found == 1);
   CleanBiosVersion(output.c_str());
 }
@@ -80,7 +82,7 @@ int CountOfType(void* handle, int type) {
   int status = smBiosGetFirst(handle, type, buffer, &length);
   for (; status == kSmbiosOk; status = smBiosGetNext(handle, type, buffer, &length)) {
     ++count;
-    const std::string_view structure(buffer, static_cast<std::size_t>(std::min<int>(length, sizeof buffer)));
+    std::string_view const structure(buffer, static_cast<std::size_t>(std::min<int>(length, sizeof buffer)));
     ReadIdentity(structure);
     ReadBiosVersion(structure);
     length = sizeof buffer;
@@ -92,12 +94,12 @@ int CountOfType(void* handle, int type) {
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
-  const std::string_view bytes(reinterpret_cast<char const*>(data), size);
+  std::string_view const bytes(reinterpret_cast<char const*>(data), size);
   static TMemoryFile file;
   file.Hold(bytes);
-  const TCounts counts = CountsInTable(bytes);
+  TCounts const counts = CountsInTable(bytes);
   void* handle = nullptr;
-  const int status = smBiosLoad(nullptr, &handle);
+  int const status = smBiosLoad(nullptr, &handle);
   Require((status == kSmbiosOk) == !smbios::DmiTableIn(bytes).empty() && (status == kSmbiosOk) == (handle != nullptr));
   for (int type : {0, 1, 2, 127, 255})
     if (handle != nullptr) Require(CountOfType(handle, type) == counts[static_cast<std::size_t>(type)]);

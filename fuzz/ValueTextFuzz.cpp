@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Reads any text as a value of every type. A number must be the one that a standard stream in the classic locale reads (0
 // when the stream fails), and every value must print, copy and compare as its type promises.
 

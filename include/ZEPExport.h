@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // Marks a symbol that libzepcore.so exports. Every other symbol of the library is hidden.

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "IIPMILan.h"
 
 #include "core/Log.h"
@@ -45,13 +46,13 @@ char ChecksumOf(char const* bytes, std::ptrdiff_t first, std::ptrdiff_t last) {
 // The length is a signed byte. A negative one leads to a byte before the message, possibly before the packet.
 bool IsChecksumRight(char const* packet, std::ptrdiff_t lengthPlace) {
   if (lengthPlace < 0) return false;
-  const std::ptrdiff_t message = lengthPlace + 1;
-  const std::ptrdiff_t last = message + static_cast<signed char>(packet[lengthPlace]) - 1;
+  std::ptrdiff_t const message = lengthPlace + 1;
+  std::ptrdiff_t const last = message + static_cast<signed char>(packet[lengthPlace]) - 1;
   return last >= 0 && ChecksumOf(packet, message, last - 1) == packet[last];
 }
 
 bool IsCompleted(char const* packet, std::ptrdiff_t lengthPlace) {
-  const std::ptrdiff_t place = lengthPlace + 1 + kCompletionCode;
+  std::ptrdiff_t const place = lengthPlace + 1 + kCompletionCode;
   return place >= 0 && packet[place] == 0;
 }
 
@@ -93,7 +94,7 @@ bool IIPMILan::IpmilanOpenConnect(std::string host, std::string user, std::strin
   LogDebug("host: ", host);
   LogDebug("username: ", user);
   LogDebug("password: ", password);  // in clear text. Kept.
-  const int result = OpenIpmiConnection(host, user, password);
+  int const result = OpenIpmiConnection(host, user, password);
   gIPMILanHost = host;
   gIPMILanPort = kIpmiPort;
   gIPMILanUser = user;
@@ -110,7 +111,7 @@ bool IIPMILan::IpmilanOpenConnect(std::string host, std::string user, std::strin
 bool IIPMILan::OpenNode(int node) {
   fCurrentNode = node;
   bringupOvdLan();
-  const TAccount account = AccountOf(node);
+  TAccount const account = AccountOf(node);
   return IpmilanOpenConnect(HostOf(node), account.first, account.second);
 }
 
@@ -119,7 +120,7 @@ bool IIPMILan::IpmiInBandLanConnect(int node, std::string pluginName) {
   if (fgipmilanInstance == nullptr || m_useGlobalAccount) return false;
   if (node == fCurrentNode && getipmiLanStatus()) return true;
   try {
-    const bool isOpen = OpenNode(node);
+    bool const isOpen = OpenNode(node);
     LogDebug(isOpen ? "IPMILan Local connected success in plugin:" : "IPMILan Local connected Failed in plugin:", pluginName);
     return isOpen;
   } catch (int error) {
@@ -173,10 +174,10 @@ bool IIPMILan::closeSocket() {
 char IIPMILan::GenSum(char* buffer, int first, int last) { return ChecksumOf(buffer, first, last); }
 
 bool IIPMILan::ChkResponse(char* packet, int lengthPosition, int mode) {
-  const bool hasAuthenticationCode = packet[kAuthenticationType] != 0;
-  const std::ptrdiff_t lengthPlace = std::ptrdiff_t(lengthPosition) - (hasAuthenticationCode ? 0 : kAuthenticationCodeSize);
-  const bool testsChecksum = mode == 0 || mode == 1;
-  const bool testsCompletion = mode == 0 || mode == 2;
+  bool const hasAuthenticationCode = packet[kAuthenticationType] != 0;
+  std::ptrdiff_t const lengthPlace = std::ptrdiff_t(lengthPosition) - (hasAuthenticationCode ? 0 : kAuthenticationCodeSize);
+  bool const testsChecksum = mode == 0 || mode == 1;
+  bool const testsCompletion = mode == 0 || mode == 2;
   if (testsChecksum && !IsChecksumRight(packet, lengthPlace)) return false;
   if (testsCompletion && !IsCompleted(packet, lengthPlace)) return false;
   fIsResponseValid = true;

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "loaders/IpmiLibrary.h"
 
 #include "TZEPException.h"
@@ -23,7 +24,7 @@ TIpmiFunctions LoadFunctions() {
 
 // When LoadFunctions throws, the next call tries again.
 TIpmiFunctions const& Functions() {
-  static const TIpmiFunctions functions = LoadFunctions();
+  static TIpmiFunctions const functions = LoadFunctions();
   return functions;
 }
 

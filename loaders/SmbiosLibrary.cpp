@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "loaders/SmbiosLibrary.h"
 
 #include "TZEPException.h"
@@ -17,7 +18,7 @@ struct TSmbiosFunctions {
 TSmbiosFunctions LoadFunctions() {
   TSharedLibrary library(::dlopen("libsmbios.so", RTLD_NOW));
   if (!library) throw TZEPException(kZEPStatusFileSystemError);
-  const TSmbiosFunctions functions = {FunctionOf<decltype(smBiosLoad)>(library.get(), "smBiosLoad"),
+  TSmbiosFunctions const functions = {FunctionOf<decltype(smBiosLoad)>(library.get(), "smBiosLoad"),
                                       FunctionOf<decltype(smBiosGetFirst)>(library.get(), "smBiosGetFirst"),
                                       FunctionOf<decltype(smBiosClose)>(library.get(), "smBiosClose")};
   if (!functions.load || !functions.getFirst || !functions.close) throw TZEPException(kZEPStatusNotFound);
@@ -27,7 +28,7 @@ TSmbiosFunctions LoadFunctions() {
 
 // When LoadFunctions throws, the next call tries again.
 TSmbiosFunctions const& Functions() {
-  static const TSmbiosFunctions functions = LoadFunctions();
+  static TSmbiosFunctions const functions = LoadFunctions();
   return functions;
 }
 
@@ -48,7 +49,7 @@ int TSmbiosTables::GetFirst(int type, char* buffer, int size, int& length) {
   length = 0;
   if (!HasHandle()) return kZEPStatusFail;
   int structureLength = size;
-  const int status = Functions().getFirst(fHandle.get(), type, buffer, &structureLength);
+  int const status = Functions().getFirst(fHandle.get(), type, buffer, &structureLength);
   length = std::clamp(structureLength, 0, size);
   return status;
 }

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "loaders/UsbLan.h"
 
 #include "core/Handles.h"
@@ -7,7 +8,7 @@
 namespace NQRVZEP20 {
 
 bool BringUpUsbLan() {
-  const TSharedLibrary library(::dlopen("./ovdusblan.so", RTLD_LAZY));
+  TSharedLibrary const library(::dlopen("./ovdusblan.so", RTLD_LAZY));
   if (!library) return false;
   auto* const getNodes = FunctionOf<decltype(GetNodes)>(library.get(), "GetNodes");
   auto* const bringUp = FunctionOf<decltype(BringupOvdLan)>(library.get(), "BringupOvdLan");
@@ -16,7 +17,7 @@ bool BringUpUsbLan() {
 
   constexpr int kIsUp = 1;
   try {
-    const int nodes = getNodes();
+    int const nodes = getNodes();
     for (int node = 0; node < nodes; ++node)
       if (queryState(node) != kIsUp) bringUp(node);
     return true;

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "os/MachineIdentity.h"
 
 #include "TOSSpecific.h"
@@ -33,13 +34,13 @@ TStructureStrings::TStructureStrings(std::string_view structure) {
 
 std::optional<std::string_view> TStructureStrings::NamedAt(std::size_t offset) const {
   if (offset >= fFormattedArea.size()) return std::nullopt;
-  const std::size_t number = ByteAt(fFormattedArea, offset);
+  std::size_t const number = ByteAt(fFormattedArea, offset);
   if (number == 0 || number > fStrings.size()) return std::nullopt;
   return fStrings[number - 1];
 }
 
 void ReadProductDescription(std::string_view description, TMachineIdentity& identity) {
-  const std::size_t dash = description.find('-');
+  std::size_t const dash = description.find('-');
   if (dash != description.npos) {
     identity.name = description.substr(0, dash);
     AssignWhole(identity.type, description, dash + 2, 4);

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TOSSpecific.h"
 
 #include "TLogger.h"
@@ -72,7 +73,7 @@ TStructure ReadSystemInformation(TSmbiosTables& tables) {
     LogDebug("Unable to allocate memory to hold machineType");
     return {};
   }
-  const int status = tables.GetFirst(kSystemInformation, structure.fBuffer.get(), kBufferSize, structure.fLength);
+  int const status = tables.GetFirst(kSystemInformation, structure.fBuffer.get(), kBufferSize, structure.fLength);
   if (status != kZEPStatusOK || structure.fLength < 1) {
     LogDebug("Unable to read DMI structure type 1 from SMBIOS");
     return {};
@@ -84,11 +85,11 @@ enum class EIdentityLog { kTypeOnly, kAll };
 
 TMachineIdentity IdentityIn(std::string_view systemInformation, EIdentityLog logged) {
   TMachineIdentity identity;
-  const TStructureStrings strings(systemInformation);
-  const std::string productDescription(strings.NamedAt(kProductName).value_or(""));
+  TStructureStrings const strings(systemInformation);
+  std::string const productDescription(strings.NamedAt(kProductName).value_or(""));
   ReadProductDescription(productDescription, identity);
   if (logged == EIdentityLog::kAll) LogIdentity(productDescription, identity);
-  if (const std::optional<std::string_view> number = strings.NamedAt(kSerialNumber)) identity.serialNumber = *number;
+  if (std::optional<std::string_view> const number = strings.NamedAt(kSerialNumber)) identity.serialNumber = *number;
   LogDebug("Machine type detected: ", identity.type);
   return identity;
 }
@@ -97,9 +98,9 @@ TMachineIdentity IdentityIn(std::string_view systemInformation, EIdentityLog log
 TMachineIdentity ReadMachineIdentity(EIdentityLog logged) {
   TSmbiosTables tables;
   if (!AreOpen(tables)) return {};
-  const TStructure structure = ReadSystemInformation(tables);
+  TStructure const structure = ReadSystemInformation(tables);
   if (!structure.fBuffer) return {};
-  const TMachineIdentity identity = IdentityIn(structure.Bytes(), logged);
+  TMachineIdentity const identity = IdentityIn(structure.Bytes(), logged);
   tables.Close();
   LogDebug("getMachineType() completed.");
   return identity;
@@ -126,7 +127,7 @@ constexpr TBiosVersionMessages kGetMachineTypeFromIDMessages = {
 
 // The BIOS version in the structure of type 0 that the buffer holds; empty when it is not in the part looked at.
 std::string BiosVersionIn(char* buffer) {
-  const std::size_t formattedLength = static_cast<unsigned char>(buffer[1]);
+  std::size_t const formattedLength = static_cast<unsigned char>(buffer[1]);
   if (formattedLength <= kBiosVersion) return {};
   char version[kBiosStringArea] = {};
   TOSSpecific::getBIDString(buffer + formattedLength, version, kBiosStringArea, static_cast<unsigned char>(buffer[kBiosVersion]));
@@ -143,7 +144,7 @@ public:
 
   // The cleaned version, empty when the read failed. Nothing when the tables cannot be opened or hold no such structure.
   std::optional<std::string> Read() {
-    const int openStatus = fTables ? fTables->OpenStatus() : kZEPStatusOutOfMemory;
+    int const openStatus = fTables ? fTables->OpenStatus() : kZEPStatusOutOfMemory;
     if (openStatus != kZEPStatusOK) {
       LogDebug(fMessages.unableToOpen, openStatus);
       return std::nullopt;
@@ -151,7 +152,7 @@ public:
 
     LogDebug(fMessages.retrieving);
     int length = 0;
-    const int status = fTables->GetFirst(kBiosInformation, fBuffer.get(), kBufferSize, length);
+    int const status = fTables->GetFirst(kBiosInformation, fBuffer.get(), kBufferSize, length);
     if (status == kZEPStatusFail) {
       LogDebug(fMessages.readFailed);
       return std::string();
@@ -188,10 +189,10 @@ constexpr unsigned kSerialNumberOffset = 0x01CC;
 
 // Asks the controller for FRU data. The session stays open. Kept.
 std::optional<TIpmiResponse> ReadFruData(unsigned offset) {
-  const auto low = static_cast<unsigned char>(offset & 0xFF);
-  const auto high = static_cast<unsigned char>(offset >> 8);
+  auto const low = static_cast<unsigned char>(offset & 0xFF);
+  auto const high = static_cast<unsigned char>(offset >> 8);
   TIpmiResponse response;
-  const int result = SendIpmiCommand({kStorage, kReadFruData, {kFruDevice, low, high, kBytesAsked}}, response);
+  int const result = SendIpmiCommand({kStorage, kReadFruData, {kFruDevice, low, high, kBytesAsked}}, response);
   return result == 0 ? std::optional(response) : std::nullopt;
 }
 
@@ -211,7 +212,7 @@ struct TAccess {
 template <class TField>
 std::string ReadRemote(std::string_view operation, TAccess const& access, unsigned offset, TField fieldOf) {
   if (OpenIpmiConnection(access.host, access.user, access.password) != 0) return "";
-  const std::optional<TIpmiResponse> response = ReadFruData(offset);
+  std::optional<TIpmiResponse> const response = ReadFruData(offset);
   if (!response) return "N/A";
   LogDebug("SendIpmiCommand successfully. \nrspBuffer for ", operation, ":");
   LogDebug(TextOf(*response));
@@ -224,11 +225,11 @@ constexpr std::size_t kPathSize = 256;  // with the zero byte
 
 // What `path` or the collector's variant says, the machine type and the local time. What does not fit is cut off.
 std::array<char, kPathSize> DebugFilePath(char const* path) {
-  const std::string start = path != nullptr             ? path
+  std::string const start = path != nullptr             ? path
                             : TOSSpecific::isOEMBuild() ? "/var/log/OEM_Support/zep_"
                                                         : "/var/log/QRV_Support/zep_";
-  const std::string type = TOSSpecific::GetMachineType();
-  const std::tm now = TLocalClock().Now().fFields;
+  std::string const type = TOSSpecific::GetMachineType();
+  std::tm const now = TLocalClock().Now().fFields;
   std::array<char, kPathSize> whole{};
   std::snprintf(whole.data(), whole.size(), "%s%s%04d%02d%02d-%02d%02d%02d.log", start.c_str(), type.c_str(), now.tm_year + 1900,
                 now.tm_mon + 1, now.tm_mday, now.tm_hour, now.tm_min, now.tm_sec);
@@ -239,7 +240,7 @@ std::array<char, kPathSize> DebugFilePath(char const* path) {
 
 std::string TOSSpecific::GetMachineInfo(std::string key) {
   LogDebug("getMachineInfo() entered.");
-  const TMachineIdentity identity = ReadMachineIdentity(EIdentityLog::kAll);
+  TMachineIdentity const identity = ReadMachineIdentity(EIdentityLog::kAll);
   if (key == "type") return identity.type;
   if (key == "name") return identity.name;
   if (key == "model") return identity.model;
@@ -262,12 +263,12 @@ std::string TOSSpecific::GetMachineType() {
 }
 
 std::string TOSSpecific::GetMachineTypeFromID() {
-  const std::string type = GetMachineType();
+  std::string const type = GetMachineType();
   TBiosVersionReader bios(kGetMachineTypeFromIDMessages);
-  if (const std::optional<std::string> version = bios.Read()) {
-    const std::string buildNumber = LowerCase(*version);
+  if (std::optional<std::string> const version = bios.Read()) {
+    std::string const buildNumber = LowerCase(*version);
     LogDebug("TOSSpecific::GetMachineTypeFromID - buildNumber is ", buildNumber);
-    if (const std::optional<std::string> typeOfBuild = MachineTypeOfBuild(buildNumber)) {
+    if (std::optional<std::string> const typeOfBuild = MachineTypeOfBuild(buildNumber)) {
       LogDebug("Get machineType from Bios ID().\nmachineType=", *typeOfBuild, "\tBios ID =", *version);
       return *typeOfBuild;
     }
@@ -278,9 +279,9 @@ std::string TOSSpecific::GetMachineTypeFromID() {
 
 std::string TOSSpecific::GetBiosID() {
   TBiosVersionReader bios(kGetBiosIDMessages);
-  const std::optional<std::string> version = bios.Read();
+  std::optional<std::string> const version = bios.Read();
   if (!version) return kNoBiosID;
-  const std::string biosID = version->empty() ? kNoBiosID : version->substr(0, 2);
+  std::string const biosID = version->empty() ? kNoBiosID : version->substr(0, 2);
   LogDebug("TOSSpecific::GetBiosID - biosID = ", biosID);
   return biosID;
 }
@@ -289,11 +290,11 @@ int TOSSpecific::getBIDString(char* stringSet, char* output, int length, int num
   if (length < 1) return 0;
   std::string_view rest(stringSet, static_cast<std::size_t>(length));
   // The empty string that closes the set is none of its strings, nor are zeros behind it.
-  const std::size_t last = rest.find_last_not_of('\0');
+  std::size_t const last = rest.find_last_not_of('\0');
   if (last == rest.npos) return 0;
   rest = rest.substr(0, last + 2);
   for (int n = 1; n <= number; ++n) {
-    const std::size_t end = rest.find('\0');
+    std::size_t const end = rest.find('\0');
     if (end == rest.npos) return 0;
     if (n == number) {
       rest.copy(output, n == 1 ? end : end + 1);
@@ -322,7 +323,7 @@ std::string TOSSpecific::GetRemoteMachineModel(std::string host, std::string use
 
 bool TOSSpecific::SetDebugLevel(int level, char* path) {
   // Marks the start of a debug session. Nothing is written to it, and nobody asks whether it could be made.
-  const TUniqueFile file(std::fopen(DebugFilePath(path).data(), "w"));
+  TUniqueFile const file(std::fopen(DebugFilePath(path).data(), "w"));
   if (level < ILogger::kLogError || level > ILogger::kLogVerbose) return false;
   TLogger::SetLogThreshold(static_cast<ILogger::EZEPLogSeverity>(level));
   return true;

@@ -1,3 +1,5 @@
+# SPDX-License-Identifier: Apache-2.0
+
 # Functions that the scripts here share: installing packages, building. Source this file; it changes to the root directory.
 
 cd "$(dirname "${BASH_SOURCE[0]}")/.."

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // The DMTF CIM schema 2.49.0, which tests read if they find it. It is not ours to hand out: the environment variable

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // SMBIOS tables for tests: the real ones of tests/data/smbios, and pieces to build others from.

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Loads the library named by its argument, resolving all symbols at once, and prints the time in nanoseconds. It is a C++
 // program, as every host is, so the C++ library is already loaded.
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The destructors of the interfaces stand here, so that each interface's virtual table is made once, in this library; and
 // the bodies of the operations that a plug-in may leave out.
 

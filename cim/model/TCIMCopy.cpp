@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TCIMCopy.h"
 
 #include "Answers.h"
@@ -51,7 +52,7 @@ void CopyPropertyDecls(ICIMClass const& cls, boost::shared_ptr<ICIMClass> copy, 
 
 // The class of the same name; empty when the value refers to none.
 boost::shared_ptr<ICIMClass> ReferencedClassIn(boost::shared_ptr<ICIMNamespace> dst, TCIMValue const& reference) {
-  const boost::shared_ptr<ICIMClass> source = reference.GetReferencedClass();
+  boost::shared_ptr<ICIMClass> const source = reference.GetReferencedClass();
   return source ? ClassIn(*dst, source->GetName(TCIMContext())) : source;
 }
 
@@ -60,7 +61,7 @@ TCIMValue CopyReference(TCIMValue const& v, boost::shared_ptr<ICIMNamespace> dst
   copy.SetReferencedClass(ReferencedClassIn(dst, v));
   if (v.IsNull()) return copy;
 
-  const TCIMReference source = v;
+  TCIMReference const source = v;
   TCIMReference path(dst, TCIMContext());
   path.SetClass(copy.GetReferencedClass());
   source.EnumerateKeyBindings(TCopyReferenceKeys(dst, path));
@@ -87,8 +88,8 @@ void TCIMCopy::CopyClasses(boost::shared_ptr<ICIMNamespace> src, boost::shared_p
 }
 
 void TCIMCopy::CopyClass(boost::shared_ptr<ICIMClass> cls, boost::shared_ptr<ICIMNamespace> dst) {
-  const boost::shared_ptr<ICIMClass> superClass = SuperClassIn(*dst, *cls);
-  const boost::shared_ptr<ICIMClass> copy = Required(dst->CreateClass(superClass, cls->GetName(TCIMContext()), TCIMContext()));
+  boost::shared_ptr<ICIMClass> const superClass = SuperClassIn(*dst, *cls);
+  boost::shared_ptr<ICIMClass> const copy = Required(dst->CreateClass(superClass, cls->GetName(TCIMContext()), TCIMContext()));
   cls->EnumerateQualifiers(TCopyQualifier(dst, copy), TCIMContext());
   CopyPropertyDecls(*cls, copy, dst);
   cls->EnumerateStaticProperties(TCopyStaticProperty(dst, copy), TCIMContext());
@@ -96,10 +97,10 @@ void TCIMCopy::CopyClass(boost::shared_ptr<ICIMClass> cls, boost::shared_ptr<ICI
 }
 
 void TCIMCopy::CopyInstance(boost::shared_ptr<ICIMInstance> inst, boost::shared_ptr<ICIMNamespace> dst) {
-  const boost::recursive_mutex::scoped_lock lock(copyInstMutex);
-  const std::string className = inst->GetClass(TCIMContext())->GetName(TCIMContext());
-  const boost::shared_ptr<ICIMClass> cls = ClassIn(*dst, className);
-  const boost::shared_ptr<ICIMInstance> copy = Required(cls->CreateInstance(TCIMContext()));
+  boost::recursive_mutex::scoped_lock const lock(copyInstMutex);
+  std::string const className = inst->GetClass(TCIMContext())->GetName(TCIMContext());
+  boost::shared_ptr<ICIMClass> const cls = ClassIn(*dst, className);
+  boost::shared_ptr<ICIMInstance> const copy = Required(cls->CreateInstance(TCIMContext()));
   inst->EnumerateProperties(TCopyInstanceProperty(dst, copy), TCIMContext());
   cls->CommitInstance(copy, TCIMContext());
 }

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The steps of the copy, in the order in which it comes to them.
 
 #include "TCIMCopy.h"
@@ -52,8 +54,8 @@ TCIMValue TypedDefault(TCIMValue::TCIMType type, TCIMValue defaultValue) {
 }
 
 bool HasProductInstances(ICIMClass const& cls) {
-  const boost::shared_ptr<ICIMQualifier> pluginName = cls.GetQualifier(kPluginNameQualifier, TCIMContext());
-  const bool isAbstract = cls.IsAbstract(TCIMContext());
+  boost::shared_ptr<ICIMQualifier> const pluginName = cls.GetQualifier(kPluginNameQualifier, TCIMContext());
+  bool const isAbstract = cls.IsAbstract(TCIMContext());
   return !isAbstract && !pluginName && cls.GetName(TCIMContext()) == kProductClassName;
 }
 
@@ -68,11 +70,11 @@ bool IsProduct(ICIMInstance const& instance) {
 TCopyQualifierDecls::TCopyQualifierDecls(boost::weak_ptr<ICIMNamespace> destination) : fDestination(destination) {}
 
 bool TCopyQualifierDecls::operator()(boost::shared_ptr<ICIMQualifierDecl> declaration) {
-  const TCIMContext none;
-  const std::string name = declaration->GetName(none);
-  const TCIMValue defaultValue = TypedDefault(declaration->GetType(none), declaration->GetDefaultValue(none));
-  const unsigned int scope = declaration->GetScope(none);
-  const unsigned int flavor = declaration->GetFlavor(none);
+  TCIMContext const none;
+  std::string const name = declaration->GetName(none);
+  TCIMValue const defaultValue = TypedDefault(declaration->GetType(none), declaration->GetDefaultValue(none));
+  unsigned int const scope = declaration->GetScope(none);
+  unsigned int const flavor = declaration->GetFlavor(none);
   Required(Lock(fDestination)->CreateQualifierDecl(name, defaultValue, scope, flavor, none));
   return true;
 }
@@ -110,8 +112,8 @@ TCopyQualifier::TCopyQualifier(boost::weak_ptr<ICIMNamespace> destination, boost
     : fDestination(destination), fTarget(target) {}
 
 bool TCopyQualifier::operator()(boost::shared_ptr<ICIMQualifier> qualifier) {
-  const TCIMContext none;
-  const boost::shared_ptr<ICIMQualifierDecl> declaration =
+  TCIMContext const none;
+  boost::shared_ptr<ICIMQualifierDecl> const declaration =
       Required(Lock(fDestination)->GetQualifierDecl(qualifier->GetName(none), none));
   Required(fTarget->AddQualifier(declaration, qualifier->GetValue(none), qualifier->GetFlavor(none), none));
   return true;
@@ -130,14 +132,14 @@ bool TCopyPropertyDecl::operator()(boost::shared_ptr<ICIMPropertyDecl> declarati
 }
 
 void TCopyPropertyDecl::Copy(ICIMPropertyDecl const& declaration) {
-  const TCIMContext none;
-  const std::string name = declaration.GetName(none);
+  TCIMContext const none;
+  std::string const name = declaration.GetName(none);
   // What these two find changes nothing, but a declaration for which one of them throws is left out. Kept.
   fTarget->GetPropertyDecl(name, none);
   declaration.GetQualifier(kOverrideQualifier, none);
 
-  const TCIMValue defaultValue = TCIMCopy::CopyValue(declaration.GetDefaultValue(none), Lock(fDestination));
-  const boost::shared_ptr<ICIMPropertyDecl> copy = Required(fTarget->AddPropertyDecl(name, defaultValue, none));
+  TCIMValue const defaultValue = TCIMCopy::CopyValue(declaration.GetDefaultValue(none), Lock(fDestination));
+  boost::shared_ptr<ICIMPropertyDecl> const copy = Required(fTarget->AddPropertyDecl(name, defaultValue, none));
   CopyQualifiers(declaration, fDestination, copy);
 }
 
@@ -145,8 +147,8 @@ TCopyStaticProperty::TCopyStaticProperty(boost::weak_ptr<ICIMNamespace> destinat
     : fDestination(destination), fTarget(target) {}
 
 bool TCopyStaticProperty::operator()(boost::shared_ptr<ICIMProperty> property) {
-  const TCIMContext none;
-  const TCIMValue value = TCIMCopy::CopyValue(property->GetValue(none), Lock(fDestination));
+  TCIMContext const none;
+  TCIMValue const value = TCIMCopy::CopyValue(property->GetValue(none), Lock(fDestination));
   fTarget->SetStaticProperty(property->GetDeclaration(none)->GetName(none), value, none);
   return true;
 }
@@ -155,8 +157,8 @@ TCopyMethodDecl::TCopyMethodDecl(boost::weak_ptr<ICIMNamespace> destination, boo
     : fDestination(destination), fTarget(target) {}
 
 bool TCopyMethodDecl::operator()(boost::shared_ptr<ICIMMethodDecl> declaration) {
-  const TCIMContext none;
-  const boost::shared_ptr<ICIMMethodDecl> copy =
+  TCIMContext const none;
+  boost::shared_ptr<ICIMMethodDecl> const copy =
       Required(fTarget->AddMethodDecl(declaration->GetName(none), declaration->GetReturnType(none), none));
   CopyQualifiers(*declaration, fDestination, copy);
   TCopyParameterDecl copyParameter(fDestination, copy);
@@ -168,8 +170,8 @@ TCopyParameterDecl::TCopyParameterDecl(boost::weak_ptr<ICIMNamespace> destinatio
     : fDestination(destination), fTarget(target) {}
 
 bool TCopyParameterDecl::operator()(boost::shared_ptr<ICIMParameterDecl> declaration) {
-  const TCIMContext none;
-  const boost::shared_ptr<ICIMParameterDecl> copy =
+  TCIMContext const none;
+  boost::shared_ptr<ICIMParameterDecl> const copy =
       Required(fTarget->AddParameterDecl(declaration->GetName(none), declaration->GetType(none),
                                          declaration->GetMaxArraySize(none), declaration->GetReferencedClassName(none), none));
   CopyQualifiers(*declaration, fDestination, copy);
@@ -182,10 +184,10 @@ TCopyInstanceProperty::TCopyInstanceProperty(boost::weak_ptr<ICIMNamespace> dest
     : fDestination(destination), fTarget(target) {}
 
 bool TCopyInstanceProperty::operator()(boost::shared_ptr<ICIMProperty> property) {
-  const TCIMContext none;
-  const TCIMValue value = property->GetValue(none);
+  TCIMContext const none;
+  TCIMValue const value = property->GetValue(none);
   if (value.IsNull()) return true;
-  const boost::shared_ptr<ICIMProperty> copy = Required(fTarget->GetProperty(property->GetName(none), none));
+  boost::shared_ptr<ICIMProperty> const copy = Required(fTarget->GetProperty(property->GetName(none), none));
   copy->SetValue(TCIMCopy::CopyValue(value, Lock(fDestination)), none);
   return true;
 }

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TCIMNumericValueImpl.h"
 
 #include "cim/value/IntegerText.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A provider plug-in: the clocks of this machine. docs/writing-a-provider.md walks through it.
 
 #include "TMemoryNamespace.h"

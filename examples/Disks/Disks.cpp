@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A provider plug-in whose classes come from a schema in MOF.
 
 #include "Mof.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #ifndef ZEP_PLATFORM_IPMI_CLIENT_H
 #define ZEP_PLATFORM_IPMI_CLIENT_H
 
@@ -51,7 +52,7 @@ enum {
  * session that is open is closed first, also when opening fails then. IPMI 2.0 is spoken, and 1.5 with a controller that
  * knows nothing else.
  */
-int OpenConnection(int mode, const char* host, const char* port, const char* user, const char* password);
+int OpenConnection(int mode, char const* host, char const* port, char const* user, char const* password);
 
 /*
  * Sends one command to the controller and waits for its answer. `response`: at least kIpmiClientResponseSize bytes;
@@ -67,7 +68,7 @@ int OpenConnection(int mode, const char* host, const char* port, const char* use
  * (kIpmiClientNoAnswer) or with kIpmiClientFail, the controller may or may not have carried the command out; the session is
  * given up, and the next command opens another.
  */
-int SendIpmiCommand(unsigned char command, const unsigned char* request, int requestLength, unsigned char* response,
+int SendIpmiCommand(unsigned char command, unsigned char const* request, int requestLength, unsigned char* response,
                     unsigned short* responseLength, unsigned char* completionCode, unsigned char netFn);
 
 /* Closes the session, if there is one. Returns 0. */

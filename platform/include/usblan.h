@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #ifndef ZEP_PLATFORM_USBLAN_H
 #define ZEP_PLATFORM_USBLAN_H
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "platform/ipmi/Fields.h"
 
 #include "platform/include/ipmiClient.h"
@@ -21,7 +22,7 @@ TFields::TFields(fiid_field_t* form) : fObject(::fiid_obj_create(form)) {
 }
 
 TFields::TFields(fiid_field_t* form, TByteVector const& bytes) : TFields(form) {
-  const auto longest = static_cast<std::size_t>(Checked(::fiid_template_len_bytes(form)));
+  auto const longest = static_cast<std::size_t>(Checked(::fiid_template_len_bytes(form)));
   Checked(::fiid_obj_set_all(Object(), bytes.data(), static_cast<unsigned>(std::min(bytes.size(), longest))));
 }
 
@@ -31,7 +32,7 @@ std::optional<std::uint64_t> TFields::Find(char const* name) const {
 }
 
 std::uint64_t TFields::Get(char const* name) const {
-  const std::optional<std::uint64_t> value = Find(name);
+  std::optional<std::uint64_t> const value = Find(name);
   if (!value) throw TFailure{kIpmiClientFail};
   return *value;
 }

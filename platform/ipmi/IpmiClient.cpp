@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The functions of libipmiClient.so.
 
 #include "platform/include/ipmiClient.h"
@@ -45,7 +47,7 @@ int SendIpmiCommand(unsigned char command, unsigned char const* request, int req
   *responseLength = 0;
   if (!Session()) return kIpmiClientNoSession;
 
-  const ipmi::TReply reply = Session()->Send(netFn, command, ipmi::TByteVector(request, request + requestLength));
+  ipmi::TReply const reply = Session()->Send(netFn, command, ipmi::TByteVector(request, request + requestLength));
   if (reply.data.size() > kIpmiClientResponseSize) return kIpmiClientFail;
   *completionCode = reply.completionCode;
   *responseLength = static_cast<unsigned short>(reply.data.size());

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "platform/ipmi/Messages.h"
 
 #include "platform/include/ipmiClient.h"
@@ -60,7 +61,7 @@ struct TMessageParts {
   // False when it is none of a controller, or was damaged on the way.
   bool ReadReply(TReply& reply) const {
     constexpr std::size_t kBeforeData = 2;  // the command and the completion code
-    const TByteVector bytes = body.Bytes();
+    TByteVector const bytes = body.Bytes();
     if (bytes.size() < kBeforeData || ::ipmi_lan_check_checksum(header.Object(), body.Object(), trailer.Object()) != 1)
       return false;
     reply.netFn = static_cast<unsigned char>(header.Get("net_fn"));
@@ -83,7 +84,7 @@ EVerdict NonsenseIfUnreadable(TRead const& read) try {
 }  // namespace
 
 TMessage MessageOf(unsigned char netFn, unsigned char sequence, TFields const& request) {
-  const TByteVector bytes = request.Bytes();
+  TByteVector const bytes = request.Bytes();
   return {netFn, sequence, bytes.at(0), TByteVector(bytes.begin() + 1, bytes.end())};
 }
 
@@ -97,8 +98,8 @@ bool IsAnswerTo(TMessage const& message, TReply const& reply) {
 
 TReply Ask(TLink& link, IEnvelope& envelope, TMessage const& message, TWaits const& waits, TClock::time_point deadline) {
   TReply reply;
-  const auto judge = [&](TPacket const& packet) {
-    const EVerdict verdict = envelope.Unpack(packet, reply);
+  auto const judge = [&](TPacket const& packet) {
+    EVerdict const verdict = envelope.Unpack(packet, reply);
     return verdict == EVerdict::kAnswer && !IsAnswerTo(message, reply) ? EVerdict::kOther : verdict;
   };
   Exchange(link, {[&] { return envelope.Pack(message); }, judge}, waits, deadline);
@@ -114,7 +115,7 @@ TEnvelope15::TEnvelope15(TSession15 const& session, std::string const* password)
 
 TPacket TEnvelope15::Pack(TMessage const& message) {
   if (message.data.size() > kMaxRequestLength15) throw TFailure{kIpmiClientBadArgument};
-  const TFields rmcp = RmcpHeader(), messageHeader = MessageHeader(message), body = MessageBody(message);
+  TFields const rmcp = RmcpHeader(), messageHeader = MessageHeader(message), body = MessageBody(message);
   TFields header(tmpl_lan_session_hdr);
   Checked(::fill_lan_session_hdr(fSession.authentication, fSession.nextPacket, fSession.id, header.Object()));
   if (fSession.nextPacket != 0 && ++fSession.nextPacket == 0) ++fSession.nextPacket;  // 0 is for packets outside of a session
@@ -129,9 +130,9 @@ TPacket TEnvelope15::Pack(TMessage const& message) {
 EVerdict TEnvelope15::Unpack(TPacket const& packet, TReply& reply) const {
   if (!Is15(packet)) return EVerdict::kNonsense;
   return NonsenseIfUnreadable([&] {
-    const TFields rmcp(tmpl_rmcp_hdr), header(tmpl_lan_session_hdr);
-    const TMessageParts parts;
-    const bool isWhole = Checked(::unassemble_ipmi_lan_pkt(packet.data(), static_cast<unsigned>(packet.size()), rmcp.Object(),
+    TFields const rmcp(tmpl_rmcp_hdr), header(tmpl_lan_session_hdr);
+    TMessageParts const parts;
+    bool const isWhole = Checked(::unassemble_ipmi_lan_pkt(packet.data(), static_cast<unsigned>(packet.size()), rmcp.Object(),
                                                            header.Object(), parts.header.Object(), parts.body.Object(),
                                                            parts.trailer.Object(), IPMI_INTERFACE_FLAGS_DEFAULT)) == 1;
     if (!isWhole || !parts.ReadReply(reply)) return EVerdict::kNonsense;
@@ -161,7 +162,7 @@ TEnvelope2::TEnvelope2(TCipherSuite const& suite, TKeys const& keys, std::uint32
     : fSuite(suite), fKeys(keys), fOwnId(ownId), fControllersId(controllersId) {}
 
 TPacket TEnvelope2::Pack(TMessage const& message) {
-  const TFields rmcp = RmcpHeader(), messageHeader = MessageHeader(message), body = MessageBody(message);
+  TFields const rmcp = RmcpHeader(), messageHeader = MessageHeader(message), body = MessageBody(message);
   TFields header(tmpl_rmcpplus_session_hdr), trailer(tmpl_rmcpplus_session_trlr);
   Checked(::fill_rmcpplus_session_hdr(IPMI_PAYLOAD_TYPE_IPMI, IPMI_PAYLOAD_FLAG_AUTHENTICATED, IPMI_PAYLOAD_FLAG_ENCRYPTED, 0, 0,
                                       fControllersId, fNextPacket, header.Object()));
@@ -180,16 +181,16 @@ EVerdict TEnvelope2::Unpack(TPacket const& packet, TReply& reply) const {
   if (!Is2(packet) || !IsOfController(PayloadByte(packet) & kPayloadType)) return EVerdict::kNonsense;
   if (PayloadByte(packet) != (IPMI_PAYLOAD_TYPE_IPMI | kIsAuthenticated | kIsEncrypted)) return EVerdict::kOther;
   return NonsenseIfUnreadable([&] {
-    const TFields rmcp(tmpl_rmcp_hdr), header(tmpl_rmcpplus_session_hdr), payload(tmpl_rmcpplus_payload);
-    const TFields trailer(tmpl_rmcpplus_session_trlr);
-    const TMessageParts parts;
-    const auto size = static_cast<unsigned>(packet.size());
-    const bool isWhole = Checked(::unassemble_ipmi_rmcpplus_pkt(
+    TFields const rmcp(tmpl_rmcp_hdr), header(tmpl_rmcpplus_session_hdr), payload(tmpl_rmcpplus_payload);
+    TFields const trailer(tmpl_rmcpplus_session_trlr);
+    TMessageParts const parts;
+    auto const size = static_cast<unsigned>(packet.size());
+    bool const isWhole = Checked(::unassemble_ipmi_rmcpplus_pkt(
                              fSuite.authentication, fSuite.integrity, fSuite.confidentiality, fKeys.integrity.data(), fKeys.size,
                              fKeys.confidentiality.data(), kConfidentialityKeySize, packet.data(), size, rmcp.Object(),
                              header.Object(), payload.Object(), parts.header.Object(), parts.body.Object(),
                              parts.trailer.Object(), trailer.Object(), IPMI_INTERFACE_FLAGS_DEFAULT)) == 1;
-    const bool isGenuine =
+    bool const isGenuine =
         isWhole && header.Get("session_id") == fOwnId &&
         ::ipmi_rmcpplus_check_packet_session_authentication_code(fSuite.integrity, packet.data(), size, fKeys.integrity.data(),
                                                                  fKeys.size, nullptr, 0, trailer.Object()) == 1;
@@ -200,7 +201,7 @@ EVerdict TEnvelope2::Unpack(TPacket const& packet, TReply& reply) const {
 }
 
 TPacket PackPayload(unsigned char type, TFields const& payload) {
-  const TFields rmcp = RmcpHeader();
+  TFields const rmcp = RmcpHeader();
   TFields header(tmpl_rmcpplus_session_hdr), trailer(tmpl_rmcpplus_session_trlr);
   Checked(::fill_rmcpplus_session_hdr(type, IPMI_PAYLOAD_FLAG_UNAUTHENTICATED, IPMI_PAYLOAD_FLAG_UNENCRYPTED, 0, 0, 0, 0,
                                       header.Object()));
@@ -218,10 +219,10 @@ EVerdict UnpackPayload(TPacket const& packet, unsigned char type, TFields& paylo
   if (!Is2(packet) || !IsOfController(PayloadByte(packet) & kPayloadType)) return EVerdict::kNonsense;
   if (PayloadByte(packet) != type) return EVerdict::kOther;
   return NonsenseIfUnreadable([&] {
-    const TFields rmcp(tmpl_rmcp_hdr), header(tmpl_rmcpplus_session_hdr), bytes(tmpl_rmcpplus_payload);
-    const TFields trailer(tmpl_rmcpplus_session_trlr);
-    const TMessageParts unused;
-    const bool isWhole =
+    TFields const rmcp(tmpl_rmcp_hdr), header(tmpl_rmcpplus_session_hdr), bytes(tmpl_rmcpplus_payload);
+    TFields const trailer(tmpl_rmcpplus_session_trlr);
+    TMessageParts const unused;
+    bool const isWhole =
         Checked(::unassemble_ipmi_rmcpplus_pkt(
             IPMI_AUTHENTICATION_ALGORITHM_RAKP_NONE, IPMI_INTEGRITY_ALGORITHM_NONE, IPMI_CONFIDENTIALITY_ALGORITHM_NONE, nullptr,
             0, nullptr, 0, packet.data(), static_cast<unsigned>(packet.size()), rmcp.Object(), header.Object(), bytes.Object(),

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Opening a session of version 1.5: the controller sends a challenge, and the client returns it signed with the password.
 
 #include "platform/include/ipmiClient.h"
@@ -15,8 +17,8 @@ TFields AskForChallenge(TOpening const& opening) {
   Checked(::fill_cmd_get_session_challenge(kAuthentication, opening.target.user.data(),
                                            static_cast<unsigned>(opening.target.user.size()), request.Object()));
   TEnvelope15 noSession;
-  const TMessage message = MessageOf(IPMI_NET_FN_APP_RQ, opening.link.NextSequence(), request);
-  const TReply reply = Ask(opening.link, noSession, message, opening.waits, opening.deadline);
+  TMessage const message = MessageOf(IPMI_NET_FN_APP_RQ, opening.link.NextSequence(), request);
+  TReply const reply = Ask(opening.link, noSession, message, opening.waits, opening.deadline);
   switch (reply.completionCode) {
     case IPMI_COMP_CODE_COMMAND_SUCCESS:
       return FieldsOf(tmpl_cmd_get_session_challenge_rs, reply);
@@ -55,7 +57,7 @@ TReply AskSigned(TOpening const& opening, IEnvelope& envelope, TMessage const& m
 }
 
 TSession15 Activate(TOpening const& opening, TFields const& challenge) {
-  const TByteVector text = challenge.Data("challenge_string");
+  TByteVector const text = challenge.Data("challenge_string");
   TSession15 session;
   session.firstReply = RandomNumber();
   session.authentication = kAuthentication;
@@ -64,10 +66,10 @@ TSession15 Activate(TOpening const& opening, TFields const& challenge) {
   Checked(::fill_cmd_activate_session(kAuthentication, IPMI_PRIVILEGE_LEVEL_ADMIN, text.data(),
                                       static_cast<unsigned>(text.size()), session.firstReply, request.Object()));
   TEnvelope15 notYetOpen(session, &opening.target.password);
-  const TReply reply = AskSigned(opening, notYetOpen, MessageOf(IPMI_NET_FN_APP_RQ, opening.link.NextSequence(), request));
+  TReply const reply = AskSigned(opening, notYetOpen, MessageOf(IPMI_NET_FN_APP_RQ, opening.link.NextSequence(), request));
   CheckActivation(reply.completionCode);
 
-  const TFields answer = FieldsOf(tmpl_cmd_activate_session_rs, reply);
+  TFields const answer = FieldsOf(tmpl_cmd_activate_session_rs, reply);
   session.id = static_cast<std::uint32_t>(answer.Get("session_id"));
   session.nextPacket = static_cast<std::uint32_t>(answer.Get("initial_inbound_sequence_number"));
   // Some controllers want a signature of this step only.
@@ -79,11 +81,11 @@ TSession15 Activate(TOpening const& opening, TFields const& challenge) {
 
 std::unique_ptr<IEnvelope> OpenVersion15(TOpening const& opening) {
   if (opening.target.password.size() > kMaxPasswordLength) throw TFailure{kIpmiClientBadArgument};
-  const bool hasMd5 = opening.contact.capabilities.Get("authentication_type.md5") != 0;
+  bool const hasMd5 = opening.contact.capabilities.Get("authentication_type.md5") != 0;
   if (!hasMd5) throw TFailure{kIpmiClientRefused};
-  const TFields challenge = AskForChallenge(opening);
-  const TSession15 session = Activate(opening, challenge);
-  const bool isSigned = session.authentication == kAuthentication;
+  TFields const challenge = AskForChallenge(opening);
+  TSession15 const session = Activate(opening, challenge);
+  bool const isSigned = session.authentication == kAuthentication;
   if (!isSigned && session.authentication != IPMI_AUTHENTICATION_TYPE_NONE) throw TFailure{kIpmiClientFail};
   return std::make_unique<TEnvelope15>(session, isSigned ? &opening.target.password : nullptr);
 }

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Opening a session of version 2.0: the controller is asked for one, both sides exchange random numbers, and each proves by
 // them that it knows the password.
 
@@ -18,7 +20,7 @@ constexpr TCipherSuite kSuite17 = {IPMI_AUTHENTICATION_ALGORITHM_RAKP_HMAC_SHA25
 
 // The size of what the suite's authentication algorithm calculates.
 unsigned DigestSize(TCipherSuite const& suite) {
-  const bool isSha256 = suite.authentication == IPMI_AUTHENTICATION_ALGORITHM_RAKP_HMAC_SHA256;
+  bool const isSha256 = suite.authentication == IPMI_AUTHENTICATION_ALGORITHM_RAKP_HMAC_SHA256;
   return isSha256 ? IPMI_HMAC_SHA256_DIGEST_LENGTH : IPMI_HMAC_SHA1_DIGEST_LENGTH;
 }
 
@@ -96,29 +98,29 @@ private:
 // Sends a step and returns its answer.
 TFields TOpening2::Step(unsigned char type, TFields const& request, unsigned char answerType, fiid_field_t* answerForm) {
   TFields answer(answerForm);
-  const auto judge = [&](TPacket const& packet) { return VerdictOn(packet, answerType, answer); };
+  auto const judge = [&](TPacket const& packet) { return VerdictOn(packet, answerType, answer); };
   Exchange(fOpening.link, {[&] { return PackPayload(type, request); }, judge}, fOpening.waits, fOpening.deadline);
   return answer;
 }
 
 EVerdict TOpening2::VerdictOn(TPacket const& packet, unsigned char type, TFields& answer) const {
-  const EVerdict verdict = UnpackPayload(packet, type, answer);
+  EVerdict const verdict = UnpackPayload(packet, type, answer);
   if (verdict != EVerdict::kAnswer) return verdict;
   // A refusal may end before the number of the session.
-  const bool isOfStep = answer.Find("message_tag") == fTag && answer.Find("remote_console_session_id").value_or(fOwnId) == fOwnId;
+  bool const isOfStep = answer.Find("message_tag") == fTag && answer.Find("remote_console_session_id").value_or(fOwnId) == fOwnId;
   return isOfStep ? EVerdict::kAnswer : EVerdict::kOther;
 }
 
 void TOpening2::AskForSession() {
   // Some controllers give no session when a privilege is named; one that the account does not have shows later.
-  const unsigned char privilege = fWay.namesPrivilege ? kPrivilege : IPMI_PRIVILEGE_LEVEL_HIGHEST_LEVEL;
+  unsigned char const privilege = fWay.namesPrivilege ? kPrivilege : IPMI_PRIVILEGE_LEVEL_HIGHEST_LEVEL;
   TFields request(tmpl_rmcpplus_open_session_request);
   Checked(::fill_rmcpplus_open_session(++fTag, privilege, fOwnId, fSuite.authentication, fSuite.integrity, fSuite.confidentiality,
                                        request.Object()));
-  const TFields answer = Step(IPMI_PAYLOAD_TYPE_RMCPPLUS_OPEN_SESSION_REQUEST, request,
+  TFields const answer = Step(IPMI_PAYLOAD_TYPE_RMCPPLUS_OPEN_SESSION_REQUEST, request,
                               IPMI_PAYLOAD_TYPE_RMCPPLUS_OPEN_SESSION_RESPONSE, tmpl_rmcpplus_open_session_response);
   CheckStatus(StatusIn(answer), TFailure::kNoSuchCipherSuite);
-  const auto highest = answer.Get("maximum_privilege_level");
+  auto const highest = answer.Get("maximum_privilege_level");
   if (highest != IPMI_PRIVILEGE_LEVEL_HIGHEST_LEVEL && highest < kPrivilege)
     throw TFailure{kIpmiClientRefused, TFailure::kNoSuchPrivilege};
   fControllersId = static_cast<std::uint32_t>(answer.Get("managed_system_session_id"));
@@ -128,12 +130,12 @@ void TOpening2::ExchangeNumbers() {
   TFields request(tmpl_rmcpplus_rakp_message_1);
   Checked(::fill_rmcpplus_rakp_message_1(++fTag, fControllersId, fOwnNumber.data(), static_cast<unsigned>(fOwnNumber.size()),
                                          kPrivilege, kLookup, User(), UserSize(), request.Object()));
-  const TFields answer =
+  TFields const answer =
       Step(IPMI_PAYLOAD_TYPE_RAKP_MESSAGE_1, request, IPMI_PAYLOAD_TYPE_RAKP_MESSAGE_2, tmpl_rmcpplus_rakp_message_2);
   CheckStatus(StatusIn(answer), TFailure::kOutOfStep);
   fControllersNumber = answer.Data("managed_system_random_number");
   fControllersGuid = answer.Data("managed_system_guid");
-  const bool knowsPassword =
+  bool const knowsPassword =
       Checked(::ipmi_rmcpplus_check_rakp_2_key_exchange_authentication_code(
           fSuite.authentication, Password(), PasswordSize(), fOwnId, fControllersId, fOwnNumber.data(),
           static_cast<unsigned>(fOwnNumber.size()), fControllersNumber.data(), static_cast<unsigned>(fControllersNumber.size()),
@@ -154,7 +156,7 @@ void TOpening2::CalculateKeys() {
 
 TByteVector TOpening2::OwnProof() const {
   TByteVector proof(DigestSize(fSuite));
-  const int size = Checked(::ipmi_calculate_rakp_3_key_exchange_authentication_code(
+  int const size = Checked(::ipmi_calculate_rakp_3_key_exchange_authentication_code(
       fSuite.authentication, Password(), PasswordSize(), fControllersNumber.data(),
       static_cast<unsigned>(fControllersNumber.size()), fOwnId, kLookup, kPrivilege, User(), UserSize(), proof.data(),
       static_cast<unsigned>(proof.size())));
@@ -164,13 +166,13 @@ TByteVector TOpening2::OwnProof() const {
 
 // The answer may be lost for good: a controller that has opened the session refuses a copy of the request, or is silent to it.
 void TOpening2::ProveToKnowThem() try {
-  const TByteVector proof = OwnProof();
+  TByteVector const proof = OwnProof();
   TFields request(tmpl_rmcpplus_rakp_message_3);
   Checked(::fill_rmcpplus_rakp_message_3(++fTag, RMCPPLUS_STATUS_NO_ERRORS, fControllersId, proof.data(),
                                          static_cast<unsigned>(proof.size()), request.Object()));
   TFields answer(tmpl_rmcpplus_rakp_message_4);
   bool isOpenAlready = false;
-  const auto judge = [&](TPacket const& packet) {
+  auto const judge = [&](TPacket const& packet) {
     isOpenAlready = IsEncryptedPayload(packet, IPMI_PAYLOAD_TYPE_RAKP_MESSAGE_4);
     return isOpenAlready ? EVerdict::kAnswer : VerdictOn(packet, IPMI_PAYLOAD_TYPE_RAKP_MESSAGE_4, answer);
   };
@@ -184,7 +186,7 @@ void TOpening2::ProveToKnowThem() try {
 
 void TOpening2::CheckProof(TFields const& answer) const {
   CheckStatus(StatusIn(answer), TFailure::kOutOfStep);
-  const bool isProof =
+  bool const isProof =
       Checked(::ipmi_rmcpplus_check_rakp_4_integrity_check_value(
           fSuite.authentication, fKeys.session.data(), fKeys.size, fOwnNumber.data(), static_cast<unsigned>(fOwnNumber.size()),
           fControllersId, fControllersGuid.data(), static_cast<unsigned>(fControllersGuid.size()), answer.Object())) == 1;

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // What opening a session has in common in both versions.
 
 #include "platform/ipmi/Opening.h"
@@ -15,7 +17,7 @@ namespace {
 
 // Some controllers have accounts without a name or without a password only.
 void CheckAccounts(TContact const& contact, TTarget const& target) {
-  const auto given = [](std::string const& text) { return text.empty() ? nullptr : text.c_str(); };
+  auto const given = [](std::string const& text) { return text.empty() ? nullptr : text.c_str(); };
   fiid_obj_t const capabilities = contact.capabilities.Object();
   if (::ipmi_check_authentication_capabilities_username(given(target.user), given(target.password), capabilities) != 1)
     throw TFailure{kIpmiClientUnknownUser};
@@ -42,13 +44,13 @@ TContact MakeContact(TLink& link, TWaits const& waits, TClock::time_point deadli
   std::map<unsigned char, TClock::time_point> sent;
   TReply reply;
   TClock::time_point answered;
-  const auto ask = [&] {
+  auto const ask = [&] {
     message.sequence = link.NextSequence();
     sent[message.sequence] = TClock::now();
     return envelope.Pack(message);
   };
-  const auto judge = [&](TPacket const& packet) {
-    const EVerdict verdict = envelope.Unpack(packet, reply);
+  auto const judge = [&](TPacket const& packet) {
+    EVerdict const verdict = envelope.Unpack(packet, reply);
     if (verdict != EVerdict::kAnswer) return verdict;
     message.sequence = reply.sequence;
     if (sent.count(reply.sequence) == 0 || !IsAnswerTo(message, reply)) return EVerdict::kOther;
@@ -69,7 +71,7 @@ std::unique_ptr<IEnvelope> OpenSession(TOpening const& opening, TWay const& way)
 void RaisePrivilege(TLink& link, IEnvelope& envelope, TWaits const& waits, TClock::time_point deadline) {
   TFields request(tmpl_cmd_set_session_privilege_level_rq);
   Checked(::fill_cmd_set_session_privilege_level(IPMI_PRIVILEGE_LEVEL_ADMIN, request.Object()));
-  const TReply reply = Ask(link, envelope, MessageOf(IPMI_NET_FN_APP_RQ, link.NextSequence(), request), waits, deadline);
+  TReply const reply = Ask(link, envelope, MessageOf(IPMI_NET_FN_APP_RQ, link.NextSequence(), request), waits, deadline);
   switch (reply.completionCode) {
     case IPMI_COMP_CODE_COMMAND_SUCCESS:
       return;

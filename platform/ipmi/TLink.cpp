@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "platform/ipmi/TLink.h"
 
 #include "platform/include/ipmiClient.h"
@@ -21,21 +22,21 @@ namespace {
 constexpr std::size_t kLongestPacket = 2048;
 
 bool IsPort(std::string const& port) {
-  const bool isNumber = !port.empty() && port.size() <= 5 && port.find_first_not_of("0123456789") == std::string::npos;
+  bool const isNumber = !port.empty() && port.size() <= 5 && port.find_first_not_of("0123456789") == std::string::npos;
   return isNumber && std::stoi(port) >= 1 && std::stoi(port) <= 65535;
 }
 
 std::string WithoutBrackets(std::string const& host) {
-  const bool hasBrackets = host.size() > 2 && host.front() == '[' && host.back() == ']';
+  bool const hasBrackets = host.size() > 2 && host.front() == '[' && host.back() == ']';
   return hasBrackets ? host.substr(1, host.size() - 2) : host;
 }
 
 // One that reports what other hosts say of packets that they did not take.
 int UnconnectedSocket(int family) {
-  const int socket = ::socket(family, SOCK_DGRAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0);
+  int const socket = ::socket(family, SOCK_DGRAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0);
   if (socket < 0 && (errno == ENOMEM || errno == ENOBUFS)) throw std::bad_alloc();
   if (socket < 0) throw TFailure{kIpmiClientUnreachable};
-  const int isOn = 1;
+  int const isOn = 1;
   if (family == AF_INET6)
     ::setsockopt(socket, IPPROTO_IPV6, IPV6_RECVERR, &isOn, sizeof isOn);
   else
@@ -44,7 +45,7 @@ int UnconnectedSocket(int family) {
 }
 
 int MillisecondsUntil(TClock::time_point until) {
-  const auto left = std::chrono::ceil<std::chrono::milliseconds>(until - TClock::now()).count();
+  auto const left = std::chrono::ceil<std::chrono::milliseconds>(until - TClock::now()).count();
   return static_cast<int>(std::max<decltype(left)>(left, 0));
 }
 
@@ -56,10 +57,10 @@ std::vector<TAddress> AddressesOf(std::string const& host, std::string const& po
   hints.ai_socktype = SOCK_DGRAM;
   hints.ai_flags = AI_NUMERICSERV;
   addrinfo* first = nullptr;
-  const int error = ::getaddrinfo(WithoutBrackets(host).c_str(), port.c_str(), &hints, &first);
+  int const error = ::getaddrinfo(WithoutBrackets(host).c_str(), port.c_str(), &hints, &first);
   if (error == EAI_MEMORY) throw std::bad_alloc();
   if (error != 0) throw TFailure{kIpmiClientHostUnknown};
-  const std::unique_ptr<addrinfo, decltype(&::freeaddrinfo)> list(first, ::freeaddrinfo);
+  std::unique_ptr<addrinfo, decltype(&::freeaddrinfo)> const list(first, ::freeaddrinfo);
 
   std::vector<TAddress> addresses;
   for (addrinfo const* entry = first; entry != nullptr; entry = entry->ai_next) {
@@ -81,7 +82,7 @@ void TLink::Send(TPacket const& packet) {
     if (::sendto(fSocket, packet.data(), packet.size(), MSG_NOSIGNAL, address, fAddress.size) >= 0) return;
     if (errno == ECONNREFUSED) fIsRefused = true;
   }
-  const bool isLost = errno == ECONNREFUSED || errno == ENOBUFS || errno == EAGAIN || errno == EINTR;
+  bool const isLost = errno == ECONNREFUSED || errno == ENOBUFS || errno == EAGAIN || errno == EINTR;
   if (!isLost) throw TFailure{kIpmiClientUnreachable};
 }
 
@@ -91,10 +92,10 @@ std::optional<TPacket> TLink::Receive(TClock::time_point until) {
     pollfd waiting = {fSocket, POLLIN, 0};
     if (::poll(&waiting, 1, MillisecondsUntil(until)) <= 0) continue;
     if ((waiting.revents & POLLERR) != 0) TakeErrors();
-    const ssize_t size = ::recv(fSocket, packet.data(), packet.size(), MSG_TRUNC);
+    ssize_t const size = ::recv(fSocket, packet.data(), packet.size(), MSG_TRUNC);
     if (size < 0) continue;
     fHasReceived = true;
-    const bool isWhole = static_cast<std::size_t>(size) <= packet.size();
+    bool const isWhole = static_cast<std::size_t>(size) <= packet.size();
     packet.resize(isWhole ? static_cast<std::size_t>(size) : 0);
     return packet;
   }
@@ -113,12 +114,12 @@ void TLink::TakeErrors() {
 
 void Exchange(TLink& link, TExchange const& exchange, TWaits const& waits, TClock::time_point deadline) {
   bool hasNonsense = false;
-  for (const auto wait : waits) {
+  for (auto const wait : waits) {
     if (TClock::now() >= deadline || link.NobodyListens()) break;
     link.Send(exchange.request());
-    const TClock::time_point until = std::min(TClock::now() + wait, deadline);
-    while (const auto packet = link.Receive(until)) {
-      const EVerdict verdict = exchange.judge(*packet);
+    TClock::time_point const until = std::min(TClock::now() + wait, deadline);
+    while (auto const packet = link.Receive(until)) {
+      EVerdict const verdict = exchange.judge(*packet);
       if (verdict == EVerdict::kAnswer) return;
       hasNonsense = hasNonsense || verdict == EVerdict::kNonsense;
     }

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "platform/ipmi/TSession.h"
 
 #include "platform/include/ipmiClient.h"
@@ -23,7 +24,7 @@ constexpr int kMostAttempts = 3;  // to open a session in one way
 // session is opened.
 int WayAfter(int way, TFailure::ECause cause) {
   TWay const& failed = kWays[way];
-  const auto isWorthTrying = [&](TWay const& next) {
+  auto const isWorthTrying = [&](TWay const& next) {
     if (failed.version == TWay::kVersion15) return false;
     if (cause == TFailure::kNoVersion2) return next.version == TWay::kVersion15;
     if (cause == TFailure::kNoSuchCipherSuite) return next.cipherSuite != failed.cipherSuite;
@@ -60,22 +61,22 @@ TWaits TSession::Lengthened(TWaits const& waits) const {
 
 // Finds the address at which the host's controller answers.
 TContact TSession::Reach(TClock::time_point deadline) {
-  const std::vector<TAddress> addresses = AddressesOf(fTarget.host, fTarget.port);
+  std::vector<TAddress> const addresses = AddressesOf(fTarget.host, fTarget.port);
   for (std::size_t n = 0;; ++n) try {
       fLink = std::make_unique<TLink>(addresses[n]);
       return MakeContact(*fLink, fTimes.contact, deadline);
     } catch (TFailure const& failure) {
-      const bool isDeadEnd = failure.status == kIpmiClientUnreachable || failure.status == kIpmiClientNoAnswer;
+      bool const isDeadEnd = failure.status == kIpmiClientUnreachable || failure.status == kIpmiClientNoAnswer;
       if (!isDeadEnd || n + 1 == addresses.size()) throw;
     }
 }
 
 void TSession::Open() {
-  const TClock::time_point deadline = TClock::now() + fTimes.wholeOpening;
+  TClock::time_point const deadline = TClock::now() + fTimes.wholeOpening;
   fEnvelope.reset();
-  const TContact contact = Reach(deadline);
+  TContact const contact = Reach(deadline);
   fContactTime = contact.answerTime;
-  const TOpening opening = {*fLink, fTarget, contact, Lengthened(fTimes.step), deadline};
+  TOpening const opening = {*fLink, fTarget, contact, Lengthened(fTimes.step), deadline};
   for (int way = fWayThatWorked;;) try {
       fEnvelope = OpenInStep(opening, kWays[way]);
       RaisePrivilege(*fLink, *fEnvelope, opening.waits, deadline);
@@ -92,8 +93,8 @@ void TSession::Open() {
 TReply TSession::Send(unsigned char netFn, unsigned char command, TByteVector const& request) try {
   if (fEnvelope && IsIdle()) Close();
   if (!fEnvelope) Open();
-  const TClock::time_point deadline = TClock::now() + fTimes.wholeCommand;
-  const TReply reply = AskInSession(netFn, command, request, deadline);
+  TClock::time_point const deadline = TClock::now() + fTimes.wholeCommand;
+  TReply const reply = AskInSession(netFn, command, request, deadline);
   if (reply.completionCode != IPMI_COMP_CODE_INSUFFICIENT_PRIVILEGE_LEVEL) return reply;
 
   // It was not carried out. A late copy of a packet that opened the session takes the privilege away with some controllers.
@@ -113,8 +114,8 @@ TReply TSession::Send(unsigned char netFn, unsigned char command, TByteVector co
 
 TReply TSession::AskInSession(unsigned char netFn, unsigned char command, TByteVector const& request,
                               TClock::time_point deadline) {
-  const TMessage message = {netFn, fLink->NextSequence(), command, request};
-  const TReply reply = Ask(*fLink, *fEnvelope, message, Lengthened(fTimes.command), deadline);
+  TMessage const message = {netFn, fLink->NextSequence(), command, request};
+  TReply const reply = Ask(*fLink, *fEnvelope, message, Lengthened(fTimes.command), deadline);
   fLastAnswer = TClock::now();
   return reply;
 }
@@ -122,7 +123,7 @@ TReply TSession::AskInSession(unsigned char netFn, unsigned char command, TByteV
 // A controller that does not answer closes the session by itself after a while.
 void TSession::Close(TClock::time_point deadline) noexcept try {
   if (!fEnvelope) return;
-  const std::unique_ptr<IEnvelope> envelope = std::move(fEnvelope);
+  std::unique_ptr<IEnvelope> const envelope = std::move(fEnvelope);
   TFields request(tmpl_cmd_close_session_rq);
   Checked(::fill_cmd_close_session(envelope->SessionId(), nullptr, request.Object()));
   Ask(*fLink, *envelope, MessageOf(IPMI_NET_FN_APP_RQ, fLink->NextSequence(), request), fTimes.close, deadline);

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The functions of libsmbios.so.
 
 #include "platform/include/smbios.h"
@@ -70,7 +72,7 @@ class TLastFile {
 public:
   // Null when that is not the file, or it has changed.
   TSharedTableFile Find(struct stat const& status) const {
-    const std::lock_guard<std::mutex> lock(fMutex);
+    std::lock_guard<std::mutex> const lock(fMutex);
     return fState == StateOf(status) ? fFile : nullptr;
   }
 
@@ -78,7 +80,7 @@ public:
   void Keep(struct stat const& status, TSharedTableFile file) {
     constexpr std::time_t kSettledAfterSeconds = 1;
     if (std::time(nullptr) - status.st_ctim.tv_sec <= kSettledAfterSeconds) return;
-    const std::lock_guard<std::mutex> lock(fMutex);
+    std::lock_guard<std::mutex> const lock(fMutex);
     fState = StateOf(status);
     fFile = std::move(file);
   }
@@ -105,7 +107,7 @@ bool ReadWhole(int fd, std::size_t size, std::string& contents) {
   contents.resize(std::min(size + 1, kMaxFileSize));
   std::size_t filled = 0;
   while (filled < contents.size()) {
-    const ssize_t got = ::read(fd, contents.data() + filled, contents.size() - filled);
+    ssize_t const got = ::read(fd, contents.data() + filled, contents.size() - filled);
     if (got < 0) return false;
     if (got == 0) break;
     filled += static_cast<std::size_t>(got);
@@ -118,11 +120,11 @@ int ReadTableFile(char const* path, TSharedTableFile& tableFile) {
   struct stat status;
   if (::stat(path, &status) == 0 && (tableFile = LastFile().Find(status))) return kSmbiosOk;
 
-  const TOpenFile file(path);
+  TOpenFile const file(path);
   if (file.Fd() < 0) return StatusOfOpenError(errno);
   if (::fstat(file.Fd(), &status) != 0) return kSmbiosFileSystemError;
   if (!S_ISREG(status.st_mode)) return kSmbiosFail;
-  const auto whole = std::make_shared<TTableFile>();
+  auto const whole = std::make_shared<TTableFile>();
   if (!ReadWhole(file.Fd(), static_cast<std::size_t>(status.st_size), whole->contents)) return kSmbiosFileSystemError;
   whole->table = smbios::DmiTableIn(whole->contents);
   tableFile = whole;
@@ -132,7 +134,7 @@ int ReadTableFile(char const* path, TSharedTableFile& tableFile) {
 
 int Load(void** handle) {
   auto loaded = std::make_unique<THandle>();
-  if (const int status = ReadTableFile(TablePath(), loaded->file); status != kSmbiosOk) return status;
+  if (int const status = ReadTableFile(TablePath(), loaded->file); status != kSmbiosOk) return status;
   if (loaded->file->table.empty()) return kSmbiosFail;
   loaded->place = smbios::TStructureReader(loaded->file->table);
   *handle = loaded.release();
@@ -141,7 +143,7 @@ int Load(void** handle) {
 
 int CopyNextOfType(THandle& handle, smbios::TStructureReader place, int type, void* buffer, int* length) {
   if (length == nullptr || *length < 0 || (buffer == nullptr && *length > 0)) return kSmbiosFail;
-  const smbios::TStructure structure = place.NextOfType(type);
+  smbios::TStructure const structure = place.NextOfType(type);
   if (structure.empty()) return kSmbiosNoMoreItems;
 
   handle.place = place;
@@ -175,7 +177,7 @@ int smBiosGetNext(void* handle, int type, void* buffer, int* length) {
 }
 
 int smBiosClose(void* handle) {
-  const std::unique_ptr<THandle> closed(static_cast<THandle*>(handle));
+  std::unique_ptr<THandle> const closed(static_cast<THandle*>(handle));
   return kSmbiosOk;
 }
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "platform/smbios/SmbiosTable.h"
 
 #include <cstddef>
@@ -23,9 +24,9 @@ std::uint64_t NumberAt(std::string_view bytes, std::size_t offset, std::size_t s
 // The whole structure that the bytes begin with, or none.
 TStructure FrontOf(std::string_view bytes) {
   if (bytes.size() < kHeaderSize) return {};
-  const std::size_t formattedLength = ByteAt(bytes, 1);
+  std::size_t const formattedLength = ByteAt(bytes, 1);
   if (formattedLength < kHeaderSize || formattedLength > bytes.size()) return {};
-  const std::size_t setEnd = bytes.find("\0\0"sv, formattedLength);
+  std::size_t const setEnd = bytes.find("\0\0"sv, formattedLength);
   if (setEnd == bytes.npos) return {};
   return bytes.substr(0, setEnd + 2);
 }
@@ -53,7 +54,7 @@ constexpr TEntryPointLayout kEntryPoint32 = {"_SM_"sv, 0x1E, 0x20, 5, 0x16, 2, 0
 constexpr TEntryPointLayout kEntryPoint64 = {"_SM3_"sv, 0x18, 0x20, 6, 0x0C, 4, 0x10, 8, false};
 
 bool IsInnerPartSound(std::string_view entryPoint) {
-  const std::string_view inner = entryPoint.substr(0x10, 0x0F);
+  std::string_view const inner = entryPoint.substr(0x10, 0x0F);
   return StartsWith(inner, "_DMI_"sv) && IsSumZero(inner);
 }
 
@@ -65,12 +66,12 @@ std::string_view TableAt(std::string_view file, std::uint64_t address, std::size
 
 std::string_view TableNamedBy(TEntryPointLayout const& layout, std::string_view file) {
   if (file.size() < layout.maxLength) return {};  // no room for a table behind it
-  const std::size_t length = ByteAt(file, layout.lengthOffset);
+  std::size_t const length = ByteAt(file, layout.lengthOffset);
   if (length < layout.minLength || length > layout.maxLength) return {};
   if (!IsSumZero(file.substr(0, length))) return {};
   if (layout.hasInnerPart && !IsInnerPartSound(file)) return {};
 
-  const std::uint64_t address = NumberAt(file, layout.tableAddressOffset, layout.tableAddressBytes);
+  std::uint64_t const address = NumberAt(file, layout.tableAddressOffset, layout.tableAddressBytes);
   return TableAt(file, address, length, NumberAt(file, layout.tableSizeOffset, layout.tableSizeBytes));
 }
 
@@ -90,7 +91,7 @@ std::string_view TableNamedByLegacy(std::string_view file) {
 int TypeOf(TStructure structure) { return static_cast<int>(ByteAt(structure, 0)); }
 
 TStructure TStructureReader::Next() {
-  const TStructure structure = FrontOf(fRest);
+  TStructure const structure = FrontOf(fRest);
   fRest.remove_prefix(structure.size());
   if (structure.empty() || TypeOf(structure) == kEndOfTableType) fRest = {};
   return structure;

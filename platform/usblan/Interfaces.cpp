@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "platform/usblan/Interfaces.h"
 
 #include <errno.h>
@@ -113,10 +114,10 @@ std::uint32_t OwnAddress(int node) { return AddressOf(169, 254, kFirstThirdOctet
 std::vector<TInterface> AllInterfaces() {
   ifaddrs* first = nullptr;
   if (::getifaddrs(&first) != 0) ThrowSystemError(errno);
-  const std::unique_ptr<ifaddrs, decltype(&::freeifaddrs)> list(first, ::freeifaddrs);
+  std::unique_ptr<ifaddrs, decltype(&::freeifaddrs)> const list(first, ::freeifaddrs);
   std::map<std::string, TInterface> byName;
   for (ifaddrs const* entry = first; entry != nullptr; entry = entry->ifa_next) {
-    const std::string name = entry->ifa_name;
+    std::string const name = entry->ifa_name;
     TInterface& interface = byName[name.substr(0, name.find(':'))];  // without the label of an address
     interface.name = name.substr(0, name.find(':'));
     interface.isUp = (entry->ifa_flags & IFF_UP) != 0;
@@ -130,7 +131,7 @@ std::vector<TInterface> AllInterfaces() {
 
 bool IsUsbNetwork(std::string const& classNet, std::string const& name) {
   std::error_code error;
-  const std::string driver = std::filesystem::read_symlink(classNet + "/" + name + "/device/driver", error).filename().string();
+  std::string const driver = std::filesystem::read_symlink(classNet + "/" + name + "/device/driver", error).filename().string();
   return !error && (driver == "cdc_ether" || driver == "cdc_subset" || driver == "rndis_host");
 }
 
@@ -147,25 +148,25 @@ std::vector<TInterface> ControllerInterfaces(std::vector<TInterface> const& all,
 }
 
 bool Reaches(TInterface const& interface, int node) {
-  const std::uint32_t controller = ControllerAddress(node);
-  const auto reaches = [controller](TAddress const& own) {
+  std::uint32_t const controller = ControllerAddress(node);
+  auto const reaches = [controller](TAddress const& own) {
     return own.address != controller && (own.address & own.mask) == (controller & own.mask) && own.mask != 0;
   };
   return interface.isUp && std::any_of(interface.addresses.begin(), interface.addresses.end(), reaches);
 }
 
 void AddOwnAddress(TInterface const& interface, int node) {
-  const unsigned index = ::if_nametoindex(interface.name.c_str());
+  unsigned const index = ::if_nametoindex(interface.name.c_str());
   if (index == 0) ThrowSystemError(ENODEV);
-  const TSocket socket(AF_NETLINK, SOCK_RAW, NETLINK_ROUTE);
-  const TNewAddress request = NewAddress(index, OwnAddress(node));
+  TSocket const socket(AF_NETLINK, SOCK_RAW, NETLINK_ROUTE);
+  TNewAddress const request = NewAddress(index, OwnAddress(node));
   if (::send(socket.Fd(), &request, sizeof request, 0) < 0) ThrowSystemError(errno);
-  const int error = AcknowledgedError(socket.Fd());
+  int const error = AcknowledgedError(socket.Fd());
   if (error != 0 && error != EEXIST) ThrowSystemError(error);
 }
 
 void TakeUp(TInterface const& interface) {
-  const TSocket socket(AF_INET, SOCK_DGRAM, 0);
+  TSocket const socket(AF_INET, SOCK_DGRAM, 0);
   ifreq request{};
   interface.name.copy(request.ifr_name, IFNAMSIZ - 1);
   if (::ioctl(socket.Fd(), SIOCGIFFLAGS, &request) != 0) ThrowSystemError(errno);

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The functions of ovdusblan.so.
 
 #include "platform/include/usblan.h"
@@ -21,7 +23,7 @@ std::vector<usblan::TInterface> Nodes() {
 bool IsNode(std::vector<usblan::TInterface> const& nodes, int node) { return node >= 0 && node < static_cast<int>(nodes.size()); }
 
 int BringUp(int node) {
-  const std::vector<usblan::TInterface> nodes = Nodes();
+  std::vector<usblan::TInterface> const nodes = Nodes();
   if (!IsNode(nodes, node)) return ENODEV;
   usblan::TInterface const& interface = nodes[static_cast<std::size_t>(node)];
   if (!interface.isThere) return ENODEV;
@@ -40,7 +42,7 @@ int GetNodes() try { return static_cast<int>(Nodes().size()); } catch (std::exce
 }
 
 int QueryOvdLanState(int node) try {
-  const std::vector<usblan::TInterface> nodes = Nodes();
+  std::vector<usblan::TInterface> const nodes = Nodes();
   return IsNode(nodes, node) && usblan::Reaches(nodes[static_cast<std::size_t>(node)], node) ? 1 : 0;
 } catch (std::exception const&) {
   return 0;

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The provider plug-in. Loading libHost.nsp.so registers the provider "Host", whose namespace is filled when it is first
 // asked for.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TSmbiosReader.h"
 
 #include "platform/include/smbios.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "CIMNames.h"
 
 #include "TZEPException.h"
@@ -38,7 +39,7 @@ std::string FoldName(std::string name) {
 // FNV-1a over the folded bytes.
 std::size_t TNameHash::operator()(std::string const& name) const {
   std::uint64_t hash = 14695981039346656037u;
-  for (const char c : name) hash = (hash ^ static_cast<unsigned char>(Fold(c))) * 1099511628211u;
+  for (char const c : name) hash = (hash ^ static_cast<unsigned char>(Fold(c))) * 1099511628211u;
   return hash;
 }
 

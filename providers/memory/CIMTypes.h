@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 #include "TCIMValue.h"
@@ -14,7 +15,7 @@ inline bool IsArrayType(TCIMValue::TCIMType type) { return (type & TCIMValue::TC
 
 // One of the fifteen CIM types, or an array of it.
 inline bool HasTypeName(TCIMValue::TCIMType type) {
-  const TCIMValue::TCIMType base = BaseTypeOf(type);
+  TCIMValue::TCIMType const base = BaseTypeOf(type);
   return base >= TCIMValue::TCIMType::kCIMTypeBoolean && base <= TCIMValue::TCIMType::kCIMTypeReference;
 }
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "FillLog.h"
 
 #include "ILogger.h"
@@ -6,7 +7,7 @@
 namespace NQRVZEP20 {
 
 void LogRefusal(std::string const& className, std::string const& member, TZEPException const& reason) {
-  const std::string what = member.empty() ? className : className + "." + member;
+  std::string const what = member.empty() ? className : className + "." + member;
   TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, what + " refused: " + reason.what());
 }
 

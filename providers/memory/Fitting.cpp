@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "Fitting.h"
 
 #include "CIMTypes.h"
@@ -19,20 +20,20 @@ TCIMValue NullLike(TCIMValue const& pattern) {
 
 TCIMValue WithBoundOf(TCIMValue const& pattern, TCIMValue const& array) {
   if (array.IsNull()) return NullLike(pattern);
-  const std::vector<TCIMValue>& elements = array;
+  std::vector<TCIMValue> const& elements = array;
   return TCIMValue(BaseTypeOf(array.GetType()), pattern.GetMaxArraySize(), elements);
 }
 
 }  // namespace
 
 TCIMValue FittedTo(TCIMValue const& pattern, TCIMValue const& value) {
-  const TCIMValue::TCIMType type = pattern.GetType();
+  TCIMValue::TCIMType const type = pattern.GetType();
   if (value.GetType() == type) return value.IsArray() ? WithBoundOf(pattern, value) : value;
   if (value.GetType() == TCIMValue::TCIMType::kCIMTypeInvalid) return NullLike(pattern);
   if (value.IsNull() || !IsInteger(type) || !IsInteger(value.GetType())) return value;
 
   std::string digits = value.ToString();
-  const TCIMValue converted(type, digits, boost::shared_ptr<ICIMNamespace>());
+  TCIMValue const converted(type, digits, boost::shared_ptr<ICIMNamespace>());
   return converted.ToString() == digits ? converted : value;  // a number out of range reads back as another one
 }
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "KeyText.h"
 
 #include "CIMNames.h"
@@ -30,8 +31,8 @@ std::string ValueText(TCIMValue const& value) {
   if (value.GetType() == TCIMValue::TCIMType::kCIMTypeReal64) return ExactText(value);
   if (value.GetType() == TCIMValue::TCIMType::kCIMTypeReal32) return ExactText(value.operator float());
   if (!value.IsReference()) return PlainText(value);
-  const TCIMReference path = value;
-  const boost::shared_ptr<ICIMClass> cls = path.GetClass();
+  TCIMReference const path = value;
+  boost::shared_ptr<ICIMClass> const cls = path.GetClass();
   return (cls ? FoldName(cls->GetName(TCIMContext())) : std::string()) + "." + KeyText(path);
 }
 

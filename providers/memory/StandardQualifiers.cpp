@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "StandardQualifiers.h"
 
 #include "CIMTypes.h"
@@ -23,7 +24,7 @@ std::vector<TStandardQualifier> StandardQualifiers() {
   constexpr unsigned int kTranslatable = kDefault | ICIMQualifierDecl::kFlavorTranslatable;
 
   using TType = TCIMValue::TCIMType;
-  const TCIMValue no(false), yes(true), noText(TType::kCIMTypeString, 0), noTexts(ArrayOf(TType::kCIMTypeString), 0),
+  TCIMValue const no(false), yes(true), noText(TType::kCIMTypeString, 0), noTexts(ArrayOf(TType::kCIMTypeString), 0),
       noUint32(TType::kCIMTypeUint32, 0), noSint64(TType::kCIMTypeSint64, 0);
   return {
       {"Abstract", no, kAnyClass, kRestricted},

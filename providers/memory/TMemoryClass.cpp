@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryClass.h"
 
 #include "CIMTypes.h"
@@ -35,7 +36,7 @@ void TMemoryClass::EnumerateSubClasses(boost::function<bool(boost::shared_ptr<IC
 boost::shared_ptr<ICIMQualifier> TMemoryClass::AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration,
                                                             TCIMValue const& value, unsigned int flavor,
                                                             TCIMContext const& context) {
-  const auto qualifier = TMemoryNamedElement::AddQualifier(declaration, value, flavor, context);
+  auto const qualifier = TMemoryNamedElement::AddQualifier(declaration, value, flavor, context);
   if (!fIsAssociation && IsMarked("Association")) MarkAsAssociation();
   return qualifier;
 }
@@ -51,13 +52,13 @@ boost::shared_ptr<ICIMPropertyDecl> TMemoryClass::AddPropertyDecl(std::string co
   if (fPropertyDecls.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
   if (HasMadeInstances()) throw TZEPException(kZEPStatusInvalidOpSequence);
 
-  const auto decl = boost::make_shared<TMemoryPropertyDecl>(name, defaultValue, Self(), Namespace());
+  auto const decl = boost::make_shared<TMemoryPropertyDecl>(name, defaultValue, Self(), Namespace());
   fPropertyDecls.Add(decl);
   return decl;
 }
 
 boost::shared_ptr<ICIMPropertyDecl const> TMemoryClass::GetPropertyDecl(std::string const& name, TCIMContext const&) const {
-  const boost::shared_ptr<TMemoryPropertyDecl const> decl = FindPropertyDecl(name);
+  boost::shared_ptr<TMemoryPropertyDecl const> const decl = FindPropertyDecl(name);
   if (!decl && !fIsDeclaring) throw TZEPException(kZEPStatusNotFound);
   return decl;
 }
@@ -68,10 +69,10 @@ void TMemoryClass::EnumeratePropertyDecls(boost::function<bool(boost::shared_ptr
 }
 
 void TMemoryClass::SetStaticProperty(std::string const& name, TCIMValue const& value, TCIMContext const& context) {
-  const boost::shared_ptr<TMemoryPropertyDecl> decl = FindPropertyDecl(name);
+  boost::shared_ptr<TMemoryPropertyDecl> const decl = FindPropertyDecl(name);
   if (!decl) throw TZEPException(kZEPStatusNotFound);
 
-  const auto property = boost::make_shared<TMemoryProperty>(decl);
+  auto const property = boost::make_shared<TMemoryProperty>(decl);
   property->SetValue(value, context);
   fStaticProperties.Put(property);
 }
@@ -98,7 +99,7 @@ boost::shared_ptr<ICIMMethodDecl> TMemoryClass::AddMethodDecl(std::string const&
   if (!HasTypeName(returnType) || IsArrayType(returnType)) throw TZEPException(kZEPStatusTypeMismatch);
   if (fMethodDecls.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
 
-  const auto decl = boost::make_shared<TMemoryMethodDecl>(name, returnType, Self(), Namespace());
+  auto const decl = boost::make_shared<TMemoryMethodDecl>(name, returnType, Self(), Namespace());
   fMethodDecls.Add(decl);
   return decl;
 }
@@ -109,20 +110,20 @@ void TMemoryClass::EnumerateMethodDecls(boost::function<bool(boost::shared_ptr<I
 }
 
 void TMemoryClass::CommitInstance(boost::shared_ptr<ICIMInstance> instance, TCIMContext const& context) {
-  const auto own = boost::dynamic_pointer_cast<TMemoryInstance>(instance);
+  auto const own = boost::dynamic_pointer_cast<TMemoryInstance>(instance);
   if (!own || own->GetClass(context).get() != this) throw TZEPException(kZEPStatusInvalidInstance);
   if (own->IsCommitted()) throw TZEPException(kZEPStatusAlreadyExists);
 
-  const std::string keys = KeyText(own->GetPath(context));
+  std::string const keys = KeyText(own->GetPath(context));
   if (!keys.empty() && !fInstancesByKeys.emplace(keys, own).second) throw TZEPException(kZEPStatusAlreadyExists);
   fInstances.push_back(own);
   own->SetCommitted();
 }
 
 boost::shared_ptr<TMemoryInstance> TMemoryClass::AddInstance(TMemoryValues const& values) {
-  const TCIMContext none;
-  const auto created = NameRefusal(Name(), "", [&] { return CreateInstance(none); });
-  const auto instance = boost::static_pointer_cast<TMemoryInstance>(created);
+  TCIMContext const none;
+  auto const created = NameRefusal(Name(), "", [&] { return CreateInstance(none); });
+  auto const instance = boost::static_pointer_cast<TMemoryInstance>(created);
   for (auto const& entry : values) NameRefusal(Name(), entry.first, [&] { instance->Set(entry.first, entry.second); });
   NameRefusal(Name(), "", [&] { CommitInstance(instance, none); });
   return instance;
@@ -141,7 +142,7 @@ boost::shared_ptr<TMemoryPropertyDecl> TMemoryClass::FindPropertyDecl(std::strin
 }
 
 boost::shared_ptr<TMemoryInstance> TMemoryClass::FindInstance(TCIMReference const& path) const {
-  const auto found = fInstancesByKeys.find(KeyText(path));
+  auto const found = fInstancesByKeys.find(KeyText(path));
   return found == fInstancesByKeys.end() ? boost::shared_ptr<TMemoryInstance>() : found->second;
 }
 
@@ -162,7 +163,7 @@ std::vector<boost::shared_ptr<TMemoryClass>> TMemoryClass::AllSubClasses() const
   std::vector<boost::shared_ptr<TMemoryClass>> all;
   std::vector<boost::shared_ptr<TMemoryClass>> pending(fSubClasses.rbegin(), fSubClasses.rend());
   while (!pending.empty()) {
-    const boost::shared_ptr<TMemoryClass> next = pending.back();
+    boost::shared_ptr<TMemoryClass> const next = pending.back();
     pending.pop_back();
     all.push_back(next);
     pending.insert(pending.end(), next->fSubClasses.rbegin(), next->fSubClasses.rend());
@@ -196,7 +197,7 @@ boost::shared_ptr<TMemoryLayout const> TMemoryClass::Layout() {
   for (auto next = without.rbegin(); next != without.rend(); ++next) {
     (*next)->fHasMadeInstances = true;
     (*next)->DeclareIn(layout);
-    const bool isSame = steps == 0 && (*next)->fPropertyDecls.Elements().empty();
+    bool const isSame = steps == 0 && (*next)->fPropertyDecls.Elements().empty();
     if (!isSame && ++steps < layout.fDecls.Elements().size() && next->get() != this) continue;
     if (!isSame) last = boost::make_shared<TMemoryLayout>(layout);
     (*next)->fLayout = last;
@@ -210,8 +211,8 @@ void TMemoryClass::DeclareIn(TMemoryLayout& layout) const {
   for (auto const& decl : fPropertyDecls.Elements()) {
     layout.fDecls.Put(decl);
     if (!decl->IsMarked("Key")) continue;
-    const std::size_t position = layout.fDecls.PositionOf(decl->Name());
-    const auto place = std::lower_bound(layout.fKeys.begin(), layout.fKeys.end(), position);
+    std::size_t const position = layout.fDecls.PositionOf(decl->Name());
+    auto const place = std::lower_bound(layout.fKeys.begin(), layout.fKeys.end(), position);
     if (place == layout.fKeys.end() || *place != position) layout.fKeys.insert(place, position);
   }
 }

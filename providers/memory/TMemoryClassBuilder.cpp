@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryClassBuilder.h"
 
 #include "FillLog.h"
@@ -14,7 +15,7 @@ TCIMValue TextArray(std::vector<std::string> const& texts) {
 
 // The default value of a property of that type.
 TCIMValue DefaultOf(TMemoryType const& type, TCIMValue const& value) {
-  const TCIMValue fitted = FittedTo(type.GetNull(), value);
+  TCIMValue const fitted = FittedTo(type.GetNull(), value);
   if (fitted.GetType() != type.GetType()) throw TZEPException(kZEPStatusTypeMismatch);
   return fitted;
 }
@@ -40,9 +41,9 @@ TMemoryClassBuilder& TMemoryClassBuilder::Key(std::string const& name, TMemoryTy
 }
 
 TMemoryClassBuilder& TMemoryClassBuilder::Reference(std::string const& name, std::string const& className) {
-  const TCIMContext none;
+  TCIMContext const none;
   NameRefusal(ClassName(), name, [&] {
-    const boost::shared_ptr<ICIMClass> referenced = fClass->GetNamespace(none)->GetClass(className, none);
+    boost::shared_ptr<ICIMClass> const referenced = fClass->GetNamespace(none)->GetClass(className, none);
     fElement = fClass->AddPropertyDecl(name, NullReferenceTo(referenced), none);
   });
   return *this;
@@ -87,9 +88,9 @@ TMemoryClassBuilder& TMemoryClassBuilder::ValueMap(std::vector<std::string> cons
 }
 
 TMemoryClassBuilder& TMemoryClassBuilder::Qualifier(std::string const& name, TCIMValue const& value) {
-  const TCIMContext none;
+  TCIMContext const none;
   NameRefusal(ClassName(), "[" + name + "]", [&] {
-    const boost::shared_ptr<ICIMQualifierDecl> decl = fClass->GetNamespace(none)->GetQualifierDecl(name, none);
+    boost::shared_ptr<ICIMQualifierDecl> const decl = fClass->GetNamespace(none)->GetQualifierDecl(name, none);
     if (!decl) throw TZEPException(kZEPStatusNotFound);
     fElement->AddQualifier(decl, FittedTo(decl->GetDefaultValue(none), value), decl->GetFlavor(none), none);
   });

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryInstance.h"
 
 #include "Fitting.h"
@@ -18,7 +19,7 @@ TMemoryInstance::TMemoryInstance(boost::weak_ptr<TMemoryClass> cls, boost::share
 boost::shared_ptr<ICIMClass> TMemoryInstance::GetClass(TCIMContext const&) const { return boost::shared_ptr<ICIMClass>(fClass); }
 
 boost::shared_ptr<ICIMProperty> TMemoryInstance::GetProperty(std::string const& name, TCIMContext const&) const {
-  const std::size_t position = fLayout->fDecls.PositionOf(name);
+  std::size_t const position = fLayout->fDecls.PositionOf(name);
   return position == fLayout->fDecls.kNone ? boost::shared_ptr<ICIMProperty>() : fProperties[position];
 }
 
@@ -28,18 +29,18 @@ void TMemoryInstance::EnumerateProperties(boost::function<bool(boost::shared_ptr
 }
 
 TCIMReference TMemoryInstance::GetPath(TCIMContext const& context) const {
-  const boost::shared_ptr<ICIMClass> cls = GetClass(context);
+  boost::shared_ptr<ICIMClass> const cls = GetClass(context);
   TCIMReference path(cls->GetNamespace(context), context);
   path.SetClass(cls);
-  for (const std::size_t key : fLayout->fKeys) {
-    const TCIMValue value = fProperties[key]->GetValue(context);
+  for (std::size_t const key : fLayout->fKeys) {
+    TCIMValue const value = fProperties[key]->GetValue(context);
     if (!value.IsNull()) path.AddKeyValue(fProperties[key]->GetName(context), value);
   }
   return path;
 }
 
 void TMemoryInstance::Set(std::string const& name, TCIMValue const& value) {
-  const TCIMContext none;
+  TCIMContext const none;
   TMemoryProperty& property = PropertyOf(name);
   property.SetValue(FittedTo(property.GetDeclaration(none)->GetDefaultValue(none), value), none);
 }
@@ -53,7 +54,7 @@ TCIMValue TMemoryInstance::GetReference() const {
 
 void TMemoryInstance::SetCommitted() {
   fIsCommitted = true;
-  for (const std::size_t key : fLayout->fKeys) fProperties[key]->Fix();
+  for (std::size_t const key : fLayout->fKeys) fProperties[key]->Fix();
 }
 
 void TMemoryInstance::DropReferences() {
@@ -61,7 +62,7 @@ void TMemoryInstance::DropReferences() {
 }
 
 TMemoryProperty& TMemoryInstance::PropertyOf(std::string const& name) const {
-  const std::size_t position = fLayout->fDecls.PositionOf(name);
+  std::size_t const position = fLayout->fDecls.PositionOf(name);
   if (position == fLayout->fDecls.kNone) throw TZEPException(kZEPStatusNotFound);
   return *fProperties[position];
 }

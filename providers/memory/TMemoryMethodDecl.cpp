@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryMethodDecl.h"
 
 #include "CIMTypes.h"
@@ -30,8 +31,8 @@ boost::shared_ptr<ICIMParameterDecl> TMemoryMethodDecl::AddParameterDecl(std::st
   RequireParameterType(type, maxArraySize, referencedClassName);
   if (fParameterDecls.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
 
-  const auto self = boost::static_pointer_cast<TMemoryMethodDecl>(shared_from_this());
-  const auto decl = boost::make_shared<TMemoryParameterDecl>(name, type, maxArraySize, referencedClassName, self, Namespace());
+  auto const self = boost::static_pointer_cast<TMemoryMethodDecl>(shared_from_this());
+  auto const decl = boost::make_shared<TMemoryParameterDecl>(name, type, maxArraySize, referencedClassName, self, Namespace());
   fParameterDecls.Add(decl);
   return decl;
 }

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 #include "ICIMNamespace.h"
@@ -30,14 +31,14 @@ public:
   boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                 unsigned int flavor, TCIMContext const& context) override {
     if (!declaration) throw TZEPException(kZEPStatusNotFound);
-    const std::string name = declaration->GetName(context);
-    const boost::shared_ptr<ICIMNamespace> ns(fNamespace);
+    std::string const name = declaration->GetName(context);
+    boost::shared_ptr<ICIMNamespace> const ns(fNamespace);
     if (ns->GetQualifierDecl(name, context) != declaration) throw TZEPException(kZEPStatusNotFound);
     if (value.GetType() != declaration->GetType(context)) throw TZEPException(kZEPStatusTypeMismatch);
     if (fQualifiers.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
 
-    const auto own = boost::static_pointer_cast<TMemoryQualifierDecl>(declaration);  // the namespace made it
-    const auto qualifier = boost::make_shared<TMemoryQualifier>(own, this->weak_from_this(), value, flavor);
+    auto const own = boost::static_pointer_cast<TMemoryQualifierDecl>(declaration);  // the namespace made it
+    auto const qualifier = boost::make_shared<TMemoryQualifier>(own, this->weak_from_this(), value, flavor);
     fQualifiers.Add(qualifier);
     return qualifier;
   }
@@ -46,7 +47,7 @@ public:
 
   // Whether the element itself carries the qualifier, with any value but false.
   bool IsMarked(std::string const& qualifierName) const {
-    const boost::shared_ptr<TMemoryQualifier> qualifier = fQualifiers.Find(qualifierName);
+    boost::shared_ptr<TMemoryQualifier> const qualifier = fQualifiers.Find(qualifierName);
     return qualifier && qualifier->IsSet();
   }
 

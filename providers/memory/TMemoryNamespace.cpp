@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryNamespace.h"
 
 #include "CIMTypes.h"
@@ -29,7 +30,7 @@ boost::shared_ptr<ICIMClass> TMemoryNamespace::CreateClass(boost::shared_ptr<ICI
   }
   if (fClasses.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
 
-  const auto cls = boost::make_shared<TMemoryClass>(shared_from_this(), ownSuperClass, name);
+  auto const cls = boost::make_shared<TMemoryClass>(shared_from_this(), ownSuperClass, name);
   fClasses.Add(cls);
   if (ownSuperClass)
     ownSuperClass->AddSubClass(cls);
@@ -50,12 +51,12 @@ boost::shared_ptr<ICIMQualifierDecl> TMemoryNamespace::CreateQualifierDecl(std::
                                                                            unsigned int scope, unsigned int flavor,
                                                                            TCIMContext const&) {
   RequireCIMName(name);
-  const TCIMValue::TCIMType type = defaultValue.GetType();
+  TCIMValue::TCIMType const type = defaultValue.GetType();
   if (!HasTypeName(type) || BaseTypeOf(type) == TCIMValue::TCIMType::kCIMTypeReference)
     throw TZEPException(kZEPStatusTypeMismatch);
   if (fQualifierDecls.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
 
-  const auto decl = boost::make_shared<TMemoryQualifierDecl>(name, defaultValue, scope, flavor);
+  auto const decl = boost::make_shared<TMemoryQualifierDecl>(name, defaultValue, scope, flavor);
   fQualifierDecls.Add(decl);
   return decl;
 }
@@ -70,16 +71,16 @@ void TMemoryNamespace::EnumerateQualifierDecls(boost::function<bool(boost::share
 }
 
 boost::shared_ptr<ICIMInstance> TMemoryNamespace::GetInstance(TCIMReference const& path, TCIMContext const& context) const {
-  const boost::shared_ptr<ICIMClass> named = path.GetClass();
-  const boost::shared_ptr<TMemoryClass> cls = named ? fClasses.Find(named->GetName(context)) : nullptr;
+  boost::shared_ptr<ICIMClass> const named = path.GetClass();
+  boost::shared_ptr<TMemoryClass> const cls = named ? fClasses.Find(named->GetName(context)) : nullptr;
   return cls ? cls->FindInstance(path) : boost::shared_ptr<TMemoryInstance>();
 }
 
 TMemoryClassBuilder TMemoryNamespace::DefineClass(std::string const& name, std::string const& superClassName) {
   DeclareStandardQualifiers();
   return NameRefusal(name, "", [&] {
-    const boost::shared_ptr<ICIMClass> superClass = superClassName.empty() ? nullptr : FindClass(superClassName);
-    const boost::shared_ptr<ICIMClass> cls = CreateClass(superClass, name, TCIMContext());
+    boost::shared_ptr<ICIMClass> const superClass = superClassName.empty() ? nullptr : FindClass(superClassName);
+    boost::shared_ptr<ICIMClass> const cls = CreateClass(superClass, name, TCIMContext());
     return TMemoryClassBuilder(boost::static_pointer_cast<TMemoryClass>(cls));
   });
 }
@@ -97,7 +98,7 @@ void TMemoryNamespace::DeclareStandardQualifiers() {
 }
 
 boost::shared_ptr<TMemoryClass> TMemoryNamespace::FindClass(std::string const& name) const {
-  const boost::shared_ptr<TMemoryClass> cls = fClasses.Find(name);
+  boost::shared_ptr<TMemoryClass> const cls = fClasses.Find(name);
   if (!cls) throw TZEPException(kZEPStatusNotFound);
   return cls;
 }

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryProperty.h"
 
 #include "CIMTypes.h"
@@ -24,7 +25,7 @@ void TMemoryProperty::SetValue(TCIMValue const& value, TCIMContext const&) {
 }
 
 void TMemoryProperty::DropReference() {
-  const TCIMValue::TCIMType type = fValue.GetType();
+  TCIMValue::TCIMType const type = fValue.GetType();
   if (BaseTypeOf(type) == TCIMValue::TCIMType::kCIMTypeReference) fValue.SetNullValue(type, fValue.GetMaxArraySize());
 }
 

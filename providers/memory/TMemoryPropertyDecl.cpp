@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryPropertyDecl.h"
 
 #include "TMemoryClass.h"
@@ -31,14 +32,14 @@ boost::shared_ptr<ICIMQualifier> TMemoryPropertyDecl::AddQualifier(boost::shared
                                                                    TCIMValue const& value, unsigned int flavor,
                                                                    TCIMContext const& context) {
   if (!declaration) throw TZEPException(kZEPStatusNotFound);
-  const boost::shared_ptr<TMemoryClass> owner(fOwner);
+  boost::shared_ptr<TMemoryClass> const owner(fOwner);
   if (owner->HasMadeInstances() && IsSameName(declaration->GetName(context), kKey))
     throw TZEPException(kZEPStatusInvalidOpSequence);
   return TMemoryNamedElement::AddQualifier(declaration, value, flavor, context);
 }
 
 boost::shared_ptr<TMemoryPropertyDecl const> TMemoryPropertyDecl::OverriddenDecl() const {
-  const boost::shared_ptr<TMemoryClass> superClass = boost::shared_ptr<TMemoryClass>(fOwner)->SuperClass();
+  boost::shared_ptr<TMemoryClass> const superClass = boost::shared_ptr<TMemoryClass>(fOwner)->SuperClass();
   return superClass ? superClass->FindPropertyDecl(Name()) : boost::shared_ptr<TMemoryPropertyDecl const>();
 }
 

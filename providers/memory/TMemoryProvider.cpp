@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryProvider.h"
 
 #include "TMemoryNamespace.h"
@@ -15,7 +16,7 @@ std::string const& TMemoryProvider::GetName(TCIMContext const&) const { return f
 
 boost::shared_ptr<ICIMNamespace> TMemoryProvider::GetNamespace(TCIMContext const&) {
   if (!fNamespace) {
-    const auto ns = boost::make_shared<TMemoryNamespace>(fNamespaceName);
+    auto const ns = boost::make_shared<TMemoryNamespace>(fNamespaceName);
     fFill(*ns);
     fNamespace = ns;
   }

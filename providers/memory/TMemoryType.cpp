@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryType.h"
 
 #include "CIMTypes.h"
@@ -13,11 +14,11 @@ namespace {
 // The bound in "[16]", 0 for "[]"; nothing when the text is neither.
 std::optional<unsigned int> ParseBrackets(std::string_view text) {
   if (text.size() < 2 || text.front() != '[' || text.back() != ']') return std::nullopt;
-  const std::string_view digits = text.substr(1, text.size() - 2);
+  std::string_view const digits = text.substr(1, text.size() - 2);
   if (digits.empty()) return 0u;
 
   unsigned int bound = 0;
-  const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), bound);
+  auto const [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), bound);
   if (error != std::errc() || end != digits.data() + digits.size() || bound == 0) return std::nullopt;
   return bound;
 }
@@ -25,14 +26,14 @@ std::optional<unsigned int> ParseBrackets(std::string_view text) {
 }  // namespace
 
 TMemoryType::TMemoryType(char const* text) : fType(TCIMValue::TCIMType::kCIMTypeInvalid) {
-  const std::string_view type(text);
-  const std::size_t bracket = type.find('[');
-  const TCIMValue::TCIMType base(std::string(type.substr(0, bracket)));
+  std::string_view const type(text);
+  std::size_t const bracket = type.find('[');
+  TCIMValue::TCIMType const base(std::string(type.substr(0, bracket)));
   if (base == TCIMValue::TCIMType::kCIMTypeInvalid || bracket == type.npos) {
     fType = base;
     return;
   }
-  if (const std::optional<unsigned int> bound = ParseBrackets(type.substr(bracket))) {
+  if (std::optional<unsigned int> const bound = ParseBrackets(type.substr(bracket))) {
     fType = ArrayOf(base);
     fMaxArraySize = *bound;
   }

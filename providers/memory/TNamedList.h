@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 #include "CIMNames.h"
@@ -16,7 +17,7 @@ namespace NQRVZEP20 {
 template <class TElement, class TCallback>
 bool VisitEach(std::vector<boost::shared_ptr<TElement>> const& elements, TCallback const& callback) {
   for (std::size_t i = 0; i < elements.size(); ++i) {
-    const boost::shared_ptr<TElement> element = elements[i];
+    boost::shared_ptr<TElement> const element = elements[i];
     if (!callback(element)) return false;
   }
   return true;
@@ -41,7 +42,7 @@ public:
 
   // Takes the place of the element of that name, which is there, or else goes to the end.
   void Put(boost::shared_ptr<TElement> element) {
-    const std::size_t position = PositionOf(element->Name());
+    std::size_t const position = PositionOf(element->Name());
     if (position == kNone) return Add(std::move(element));
     fElements[position] = std::move(element);
   }
@@ -50,7 +51,7 @@ public:
 
   std::size_t PositionOf(std::string const& name) const {
     if (!fIndex.empty()) {
-      const std::uint32_t entry = fIndex[SlotOf(name)];
+      std::uint32_t const entry = fIndex[SlotOf(name)];
       return entry == 0 ? kNone : entry - 1;
     }
     for (std::size_t i = 0; i < fElements.size(); ++i)
@@ -60,7 +61,7 @@ public:
 
   // Empty when there is none of that name.
   boost::shared_ptr<TElement> Find(std::string const& name) const {
-    const std::size_t position = PositionOf(name);
+    std::size_t const position = PositionOf(name);
     return position == kNone ? boost::shared_ptr<TElement>() : fElements[position];
   }
 
@@ -76,7 +77,7 @@ private:
 
   // The slot of the element of that name, or the free one where it belongs.
   std::size_t SlotOf(std::string const& name) const {
-    const std::size_t mask = fIndex.size() - 1;
+    std::size_t const mask = fIndex.size() - 1;
     std::size_t slot = TNameHash()(name) & mask;
     while (fIndex[slot] != 0 && !IsSameName(fElements[fIndex[slot] - 1]->Name(), name)) slot = (slot + 1) & mask;
     return slot;

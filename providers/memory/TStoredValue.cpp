@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TStoredValue.h"
 
 #include "CIMTypes.h"
@@ -40,11 +41,11 @@ std::unique_ptr<char[]> Packed(std::vector<std::string> const& strings) {
   for (std::string const& text : strings) size += sizeof(TLength) + text.size();
   std::unique_ptr<char[]> packed(new char[size]);
   char* at = packed.get();
-  const TLength count = static_cast<TLength>(strings.size());
+  TLength const count = static_cast<TLength>(strings.size());
   std::memcpy(at, &count, sizeof count);
   at += sizeof count;
   for (std::string const& text : strings) {
-    const TLength length = static_cast<TLength>(text.size());
+    TLength const length = static_cast<TLength>(text.size());
     std::memcpy(at, &length, sizeof length);
     std::memcpy(at + sizeof length, text.data(), length);
     at += sizeof length + length;
@@ -65,8 +66,8 @@ TLength NumberAt(char const* packed) {
 }
 
 std::string NextOf(char const*& packed) {
-  const TLength length = NumberAt(packed);
-  const std::string text(packed + sizeof length, length);
+  TLength const length = NumberAt(packed);
+  std::string const text(packed + sizeof length, length);
   packed += sizeof length + length;
   return text;
 }
@@ -74,14 +75,14 @@ std::string NextOf(char const*& packed) {
 }  // namespace
 
 TStoredValue::TStoredValue(TCIMValue const& value) : fType(value.GetType()), fMaxArraySize(value.GetMaxArraySize()) {
-  const bool isPlain = IsArrayType(fType) || fMaxArraySize == 0;
+  bool const isPlain = IsArrayType(fType) || fMaxArraySize == 0;
   if (isPlain && IsNullOfNoClass(value)) return;
   if (isPlain && fType == TType::kCIMTypeBoolean && !value.IsNull()) {
     fData = static_cast<bool>(value);
     return;
   }
   if (isPlain && IsOfStrings(value)) {
-    const std::vector<std::string> strings = StringsOf(value);
+    std::vector<std::string> const strings = StringsOf(value);
     if (AreShort(strings)) {
       fData = Packed(strings);
       return;
@@ -102,7 +103,7 @@ TCIMValue TStoredValue::Get() const {
   char const* at = strings->get() + sizeof(TLength);
   if (!IsArrayType(fType)) return TCIMValue(NextOf(at));
   std::vector<TCIMValue> elements;
-  const TLength count = NumberAt(strings->get());
+  TLength const count = NumberAt(strings->get());
   elements.reserve(count);
   while (elements.size() < count) elements.emplace_back(NextOf(at));
   return TCIMValue(BaseTypeOf(fType), fMaxArraySize, elements);

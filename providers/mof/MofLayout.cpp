@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/MofLayout.h"
 
 #include "ICIMNamespace.h"
@@ -21,19 +22,19 @@ std::size_t EndOfPiece(std::string const& text, std::size_t start, std::size_t w
   std::size_t end = std::min(start + width, text.size());
   while (end > start && Escaped(std::string_view(text).substr(start, end - start)).size() > width) --end;
   if (end == text.size()) return end;
-  const std::size_t blank = text.find_last_of(" \n", end - 1);
+  std::size_t const blank = text.find_last_of(" \n", end - 1);
   if (blank != text.npos && blank >= start) return blank + 1;
   while (end > start + 1 && IsInsideCharacter(text[end])) --end;
   return end;
 }
 
 std::string StringText(std::string const& text, std::size_t column, std::size_t indent) {
-  const std::string whole = "\"" + Escaped(text) + "\"";
+  std::string const whole = "\"" + Escaped(text) + "\"";
   if (column + whole.size() <= kWidth) return whole;
-  const std::size_t width = kWidth - std::min<std::size_t>(indent + 2, 60);
+  std::size_t const width = kWidth - std::min<std::size_t>(indent + 2, 60);
   std::string pieces;
   for (std::size_t start = 0; start < text.size();) {
-    const std::size_t end = EndOfPiece(text, start, width);
+    std::size_t const end = EndOfPiece(text, start, width);
     pieces += NewLine(indent) + "\"" + Escaped(std::string_view(text).substr(start, end - start)) + "\"";
     start = end;
   }
@@ -47,9 +48,9 @@ std::string MofList(std::vector<std::string> const& items, std::size_t column, s
   std::string list;
   bool wasBroken = false;
   for (std::size_t at = 0; at < items.size(); ++at) {
-    const std::string item = items[at] + (at + 1 < items.size() ? "," : "");
-    const bool isBroken = item.find('\n') != item.npos;
-    const bool fits = !isBroken && !wasBroken && column + 1 + item.size() <= kWidth;
+    std::string const item = items[at] + (at + 1 < items.size() ? "," : "");
+    bool const isBroken = item.find('\n') != item.npos;
+    bool const fits = !isBroken && !wasBroken && column + 1 + item.size() <= kWidth;
     if (at > 0) list += fits ? " " : NewLine(indent);
     if (at > 0) column = fits ? column + 1 : indent;
     list += item;

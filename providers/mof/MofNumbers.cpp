@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/MofNumbers.h"
 
 #include <charconv>
@@ -22,15 +23,15 @@ struct TInteger {
 }
 
 bool TakeSign(std::string_view& digits) {
-  const bool isNegative = digits.front() == '-';
+  bool const isNegative = digits.front() == '-';
   if (isNegative || digits.front() == '+') digits.remove_prefix(1);
   return isNegative;
 }
 
 // Takes off what tells the base.
 int TakeBase(std::string_view& digits) {
-  const char last = digits.empty() ? '0' : digits.back();
-  const bool isHexadecimal = digits.size() > 2 && digits[0] == '0' && (digits[1] == 'x' || digits[1] == 'X');
+  char const last = digits.empty() ? '0' : digits.back();
+  bool const isHexadecimal = digits.size() > 2 && digits[0] == '0' && (digits[1] == 'x' || digits[1] == 'X');
   if (isHexadecimal) return digits.remove_prefix(2), 16;
   if (last == 'b' || last == 'B') return digits.remove_suffix(1), 2;
   return digits.size() > 1 && digits[0] == '0' ? 8 : 10;
@@ -38,8 +39,8 @@ int TakeBase(std::string_view& digits) {
 
 TInteger ReadInteger(std::string_view digits, TType type, TMofPlace const& place) {
   TInteger integer{TakeSign(digits), 0};
-  const int base = TakeBase(digits);
-  const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), integer.fMagnitude, base);
+  int const base = TakeBase(digits);
+  auto const [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), integer.fMagnitude, base);
   if (error == std::errc::result_out_of_range) RefuseRange(place, type);
   if (error != std::errc() || end != digits.data() + digits.size()) throw TMofError(place, "expected an integer");
   return integer;
@@ -47,18 +48,18 @@ TInteger ReadInteger(std::string_view digits, TType type, TMofPlace const& place
 
 template <class T>
 TCIMValue IntegerValue(std::string_view text, TType type, TMofPlace const& place) {
-  const TInteger integer = ReadInteger(text, type, place);
-  const std::uint64_t most = static_cast<std::uint64_t>(std::numeric_limits<T>::max());
-  const std::uint64_t least = std::is_signed_v<T> ? most + 1 : 0;  // of the negative ones, without the sign
+  TInteger const integer = ReadInteger(text, type, place);
+  std::uint64_t const most = static_cast<std::uint64_t>(std::numeric_limits<T>::max());
+  std::uint64_t const least = std::is_signed_v<T> ? most + 1 : 0;  // of the negative ones, without the sign
   if (integer.fMagnitude > (integer.fIsNegative ? least : most)) RefuseRange(place, type);
   return TCIMValue(static_cast<T>(integer.fIsNegative ? 0 - integer.fMagnitude : integer.fMagnitude));
 }
 
 template <class T>
 TCIMValue RealValue(std::string_view digits, TType type, TMofPlace const& place) {
-  const bool isNegative = TakeSign(digits);
+  bool const isNegative = TakeSign(digits);
   T number = 0;
-  const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), number);
+  auto const [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), number);
   if (error == std::errc::result_out_of_range) RefuseRange(place, type);
   if (error != std::errc() || end != digits.data() + digits.size()) throw TMofError(place, "expected a number");
   return TCIMValue(isNegative ? -number : number);

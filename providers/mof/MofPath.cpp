@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Object paths in the form of DSP0004.
 
 #include "providers/mof/MofValues.h"
@@ -15,7 +17,7 @@ namespace NQRVZEP20 {
 
 namespace {
 
-const TCIMContext kNone;
+TCIMContext const kNone;
 
 // The keys of a path, one after another.
 class TKeyReader {
@@ -25,31 +27,31 @@ public:
 
   void ReadInto(TCIMReference& path) {
     for (bool isMore = true; isMore; isMore = TakeComma()) {
-      const TMofToken name = Take(TMofToken::kName);
+      TMofToken const name = Take(TMofToken::kName);
       if (Take(TMofToken::kMark).fText != "=") Refuse(name);
-      const std::string key(name.fText);
-      const auto type = path.GetClass()->GetPropertyDecl(key, kNone)->GetType(kNone);
+      std::string const key(name.fText);
+      auto const type = path.GetClass()->GetPropertyDecl(key, kNone)->GetType(kNone);
       path.AddKeyValue(key, ReadMofValue(TakeValue(type), type, 0, fNamespace));
     }
   }
 
 private:
   TMofToken Take(TMofToken::EKind kind) {
-    const TMofToken token = fLexer.Next();
+    TMofToken const token = fLexer.Next();
     if (token.fKind != kind) Refuse(token);
     return token;
   }
 
   bool TakeComma() {
-    const TMofToken token = fLexer.Next();
+    TMofToken const token = fLexer.Next();
     if (token.fKind != TMofToken::kEnd && token.fText != ",") Refuse(token);
     return token.fKind != TMofToken::kEnd;
   }
 
   TMofValue TakeValue(TCIMValue::TCIMType type) {
-    const TMofToken token = fLexer.Next();
+    TMofToken const token = fLexer.Next();
     TMofLiteral literal{TMofLiteral::kNull, {&fKeys, token.fText}, {}};
-    const bool isQuoted = token.fKind == TMofToken::kString;
+    bool const isQuoted = token.fKind == TMofToken::kString;
     if (isQuoted && type >= TCIMValue::TCIMType::kCIMTypeString) {
       literal.fKind = TMofLiteral::kString;
       AppendUnescaped(literal.fString, literal.fPlace);
@@ -57,7 +59,7 @@ private:
       literal.fKind = TMofLiteral::kChar;
     else {  // a word or a number, which may stand in quotes
       if (isQuoted) literal.fPlace.fText = token.fText.substr(1, token.fText.size() - 2);
-      const std::string_view word = literal.fPlace.fText;
+      std::string_view const word = literal.fPlace.fText;
       literal.fKind = IsSameName(word, "true") || IsSameName(word, "false") ? TMofLiteral::kBoolean : TMofLiteral::kNumber;
       if (word.empty()) Refuse(token);
     }
@@ -72,8 +74,8 @@ private:
 };
 
 TCIMValue Read(std::string const& text, boost::shared_ptr<ICIMNamespace> ns) {
-  const std::size_t start = text.rfind(':', text.find('=')) + 1;  // 0 when there is none
-  const std::size_t dot = text.find('.', start);
+  std::size_t const start = text.rfind(':', text.find('=')) + 1;  // 0 when there is none
+  std::size_t const dot = text.find('.', start);
   TCIMReference path(ns, kNone);
   path.SetClassName(text.substr(start, dot == text.npos ? dot : dot - start));
   if (dot != text.npos) TKeyReader(text.substr(dot + 1), ns).ReadInto(path);

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/Mof.h"
 #include "providers/mof/TMofBuilder.h"
 #include "providers/mof/TMofParser.h"

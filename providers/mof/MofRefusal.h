@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 #include "providers/mof/TMofError.h"
@@ -15,8 +16,8 @@ auto AtPlace(TMofPlace const& place, EZEPStatusCode expected, char const* words,
   } catch (TMofError const&) {
     throw;
   } catch (TZEPException const& reason) {
-    const EZEPStatusCode status = reason.GetStatusCode().GetCode();
-    const std::string name = NameAt(place);
+    EZEPStatusCode const status = reason.GetStatusCode().GetCode();
+    std::string const name = NameAt(place);
     throw TMofError(place, status == expected ? name + " " + words : name + " is refused: " + reason.what(), status);
   }
 }

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/MofStrings.h"
 
 #include <algorithm>
@@ -31,17 +32,17 @@ void AppendUtf8(std::string& text, unsigned int code) {
 
 // The code that the escape at the start of `rest`, a backslash, stands for; takes it off. `place` is the literal.
 unsigned int TakeEscape(std::string_view& rest, TMofPlace const& place) {
-  const std::string_view start = rest;
+  std::string_view const start = rest;
   rest.remove_prefix(2);  // the lexer leaves no backslash at the end
   if (start[1] == 'x' || start[1] == 'X') {
     unsigned int code = 0;
-    const char* const end = rest.data() + std::min<std::size_t>(rest.size(), 4);
-    const char* const stop = std::from_chars(rest.data(), end, code, 16).ptr;
+    char const* const end = rest.data() + std::min<std::size_t>(rest.size(), 4);
+    char const* const stop = std::from_chars(rest.data(), end, code, 16).ptr;
     if (stop == rest.data()) throw TMofError({place.fFile, start}, "expected one to four hexadecimal digits behind \"\\x\"");
     rest.remove_prefix(static_cast<std::size_t>(stop - rest.data()));
     return code;
   }
-  const std::size_t escape = kEscapes.find(start[1]);
+  std::size_t const escape = kEscapes.find(start[1]);
   if (escape == kEscapes.npos) throw TMofError({place.fFile, start}, "this escape is unknown");
   return static_cast<unsigned char>(kEscaped[escape]);
 }
@@ -49,8 +50,8 @@ unsigned int TakeEscape(std::string_view& rest, TMofPlace const& place) {
 // The code of the UTF-8 character of one to three bytes at the start of `rest`, which it takes off; above 0xffff for anything
 // else.
 unsigned int TakeCharacter(std::string_view& rest) {
-  const auto byte = [&rest](std::size_t at) { return static_cast<unsigned char>(rest[at]); };
-  const std::size_t size = byte(0) < 0x80 ? 1 : byte(0) < 0xe0 ? 2 : 3;
+  auto const byte = [&rest](std::size_t at) { return static_cast<unsigned char>(rest[at]); };
+  std::size_t const size = byte(0) < 0x80 ? 1 : byte(0) < 0xe0 ? 2 : 3;
   if (rest.size() < size || (byte(0) >= 0x80 && byte(0) < 0xc2) || byte(0) >= 0xf0) return 0x10000;
   unsigned int code = size == 1 ? byte(0) : byte(0) & (size == 2 ? 0x1f : 0x0f);
   for (std::size_t at = 1; at < size; ++at) {
@@ -74,8 +75,8 @@ void AppendUnescaped(std::string& text, TMofPlace const& literal) {
   for (std::size_t backslash; (backslash = rest.find('\\')) != rest.npos;) {
     text.append(rest.substr(0, backslash));
     rest.remove_prefix(backslash);
-    const std::string_view escape = rest;
-    const unsigned int code = TakeEscape(rest, literal);
+    std::string_view const escape = rest;
+    unsigned int const code = TakeEscape(rest, literal);
     if (IsSurrogate(code)) throw TMofError({literal.fFile, escape}, "half of a surrogate pair is no character");
     AppendUtf8(text, code);
   }
@@ -93,8 +94,8 @@ unsigned short CharacterOf(TMofPlace const& literal) {
 std::string Escaped(std::string_view text) {
   std::string escaped;
   escaped.reserve(text.size() + 16);
-  for (const char c : text) {
-    const std::size_t at = c == '\'' ? kEscaped.npos : kEscaped.find(c);
+  for (char const c : text) {
+    std::size_t const at = c == '\'' ? kEscaped.npos : kEscaped.find(c);
     if (at != kEscaped.npos) {
       escaped += '\\';
       escaped += kEscapes[at];
@@ -107,7 +108,7 @@ std::string Escaped(std::string_view text) {
 }
 
 std::string EscapedCharacter(unsigned short code) {
-  const bool isPlain = code >= 0x20 && code < 0x7f && code != '\'' && code != '\\';
+  bool const isPlain = code >= 0x20 && code < 0x7f && code != '\'' && code != '\\';
   return "'" + (isPlain ? std::string(1, static_cast<char>(code)) : HexadecimalEscape(code)) + "'";
 }
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/MofValues.h"
 
 #include "ICIMClass.h"
@@ -62,7 +63,7 @@ std::string CharacterText(TCIMValue const& value) {
 // A value that holds a NULL datetime is NULL to the reader.
 std::string DateTimeText(TCIMDateTime const& datetime) {
   if (datetime.IsNull()) return "NULL";
-  const std::string text = datetime.ToString();
+  std::string const text = datetime.ToString();
   if (text.size() != 25) ThrowUnprintable();
   return "\"" + text + "\"";
 }
@@ -72,7 +73,7 @@ std::string DateTimeText(TCIMDateTime const& datetime) {
 void ThrowUnprintable() { throw TZEPException(kZEPStatusNotSupported); }
 
 TCIMValue ReadMofValue(TMofValue const& value, TType type, unsigned int maxArraySize, boost::shared_ptr<ICIMNamespace> ns) {
-  const bool isNull = !value.fIsArray && value.fLiterals.front().fKind == TMofLiteral::kNull;
+  bool const isNull = !value.fIsArray && value.fLiterals.front().fKind == TMofLiteral::kNull;
   if (isNull) return TCIMValue(type, IsArrayType(type) ? maxArraySize : 0);
   if (value.fIsArray && !IsArrayType(type)) throw TMofError(value.fPlace, "expected one value, not an array of them");
   if (!value.fIsArray && IsArrayType(type)) throw TMofError(value.fPlace, "expected an array of values in braces");

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/Mof.h"
 
 #include "ICIMClass.h"
@@ -17,7 +18,7 @@ namespace {
 using TClasses = std::vector<boost::shared_ptr<ICIMClass>>;
 using TInstances = std::vector<boost::shared_ptr<ICIMInstance>>;
 
-const TCIMContext kNone;
+TCIMContext const kNone;
 
 bool IsPlain(boost::shared_ptr<ICIMClass> const& cls) { return !cls->GetClassFlag(kNone); }
 
@@ -45,13 +46,13 @@ std::map<std::string, TClasses> SubClassesOf(TClasses const& roots) {
 
 // Plain classes first and then associations, each below its superclass: what is referred to is above.
 TClasses InWrittenOrder(TClasses const& roots) {
-  const std::map<std::string, TClasses> subClasses = SubClassesOf(roots);
+  std::map<std::string, TClasses> const subClasses = SubClassesOf(roots);
   TClasses all;
   TClasses pending(roots.rbegin(), roots.rend());  // the next one last
   while (!pending.empty()) {
     all.push_back(pending.back());
     pending.pop_back();
-    const auto below = subClasses.find(all.back()->GetName(kNone));
+    auto const below = subClasses.find(all.back()->GetName(kNone));
     if (below != subClasses.end()) pending.insert(pending.end(), below->second.rbegin(), below->second.rend());
   }
   std::stable_partition(all.begin(), all.end(), IsPlain);
@@ -80,8 +81,8 @@ std::string WriteMof(ICIMNamespace const& ns) {
         return true;
       },
       kNone);
-  const TClasses roots = RootClassesOf(ns);
-  const TClasses classes = InWrittenOrder(roots);
+  TClasses const roots = RootClassesOf(ns);
+  TClasses const classes = InWrittenOrder(roots);
   for (auto const& cls : classes) writer.WriteClass(*cls);
   std::map<std::string, TInstances> instances = InstancesByClass(roots);
   for (auto const& cls : classes)

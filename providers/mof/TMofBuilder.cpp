@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/TMofBuilder.h"
 
 #include "ICIMClass.h"
@@ -18,7 +19,7 @@ namespace {
 
 using TType = TCIMValue::TCIMType;
 
-const TCIMContext kNone;
+TCIMContext const kNone;
 
 }  // namespace
 
@@ -60,13 +61,13 @@ void TMofBuilder::AddProperty(TMofFeature const& property, ICIMClass& cls) {
   TCIMValue value = NullOfProperty(property.fType);
   TCIMValue staticValue;
   if (property.fDefault) {
-    const TCIMValue written = ReadMofValue(*property.fDefault, property.fType.fType, property.fType.fMaxArraySize, fNamespace);
+    TCIMValue const written = ReadMofValue(*property.fDefault, property.fType.fType, property.fType.fMaxArraySize, fNamespace);
     if (written.IsReference() && !written.IsNull() && written.GetReferencedClass() != value.GetReferencedClass())
       throw TMofError(property.fDefault->fPlace, "expected an object of the class itself that the reference refers to");
     TCIMValue& target = HasStatic(property.fQualifiers) ? staticValue : value;
     if (!written.IsNull()) target = TCIMValue(written);
   }
-  const auto made = AtPlace(property.fName, kZEPStatusAlreadyExists, "is declared already in this class",
+  auto const made = AtPlace(property.fName, kZEPStatusAlreadyExists, "is declared already in this class",
                             [&] { return cls.AddPropertyDecl(NameAt(property.fName), value, kNone); });
   AddQualifiers(property.fQualifiers, *made);
   if (!staticValue.IsNull())
@@ -76,7 +77,7 @@ void TMofBuilder::AddProperty(TMofFeature const& property, ICIMClass& cls) {
 void TMofBuilder::AddMethod(TMofFeature const& method, ICIMClass& cls) {
   if (method.fType.fType == TType::kCIMTypeReference || IsArrayType(method.fType.fType))
     throw TMofError(method.fName, "a method returns neither a reference nor an array");
-  const auto made = AtPlace(method.fName, kZEPStatusAlreadyExists, "is declared already in this class",
+  auto const made = AtPlace(method.fName, kZEPStatusAlreadyExists, "is declared already in this class",
                             [&] { return cls.AddMethodDecl(NameAt(method.fName), method.fType.fType, kNone); });
   AddQualifiers(method.fQualifiers, *made);
   for (TMofParameter const& parameter : method.fParameters) AddParameter(parameter, *made);
@@ -86,7 +87,7 @@ void TMofBuilder::AddParameter(TMofParameter const& parameter, ICIMMethodDecl& m
   TMofType const& type = parameter.fType;
   std::string className;
   if (BaseTypeOf(type.fType) == TType::kCIMTypeReference) className = FindClass(type.fReferencedClass)->GetName(kNone);
-  const auto made = AtPlace(parameter.fName, kZEPStatusAlreadyExists, "is declared already in this method", [&] {
+  auto const made = AtPlace(parameter.fName, kZEPStatusAlreadyExists, "is declared already in this method", [&] {
     return method.AddParameterDecl(NameAt(parameter.fName), type.fType, type.fMaxArraySize, className, kNone);
   });
   AddQualifiers(parameter.fQualifiers, *made);
@@ -95,7 +96,7 @@ void TMofBuilder::AddParameter(TMofParameter const& parameter, ICIMMethodDecl& m
 void TMofBuilder::AddQualifiers(TMofQualifiers const& qualifiers, ICIMNamedElement& element) {
   for (TMofQualifier const& qualifier : qualifiers) {
     TDeclaredQualifier const& declared = Declared(qualifier.fName);
-    const TCIMValue value = ValueOf(qualifier, declared);
+    TCIMValue const value = ValueOf(qualifier, declared);
     AtPlace(qualifier.fName, kZEPStatusAlreadyExists, "is written twice here",
             [&] { element.AddQualifier(declared.fDecl, value, qualifier.fFlavor.value_or(declared.fFlavor), kNone); });
   }
@@ -108,14 +109,14 @@ TCIMValue TMofBuilder::ValueOf(TMofQualifier const& qualifier, TDeclaredQualifie
 }
 
 TMofBuilder::TDeclaredQualifier const& TMofBuilder::Declared(TMofPlace const& name) {
-  const auto found = fDeclared.find(name.fText);
+  auto const found = fDeclared.find(name.fText);
   if (found != fDeclared.end()) return found->second;
-  const auto decl = AtPlace(name, kZEPStatusNotFound, "is no qualifier that is declared", [&] {
-    const boost::shared_ptr<ICIMQualifierDecl> named = fNamespace->GetQualifierDecl(NameAt(name), kNone);
+  auto const decl = AtPlace(name, kZEPStatusNotFound, "is no qualifier that is declared", [&] {
+    boost::shared_ptr<ICIMQualifierDecl> const named = fNamespace->GetQualifierDecl(NameAt(name), kNone);
     if (!named) throw TZEPException(kZEPStatusNotFound);
     return named;
   });
-  const TDeclaredQualifier declared{decl, decl->GetType(kNone), decl->GetDefaultValue(kNone), decl->GetFlavor(kNone)};
+  TDeclaredQualifier const declared{decl, decl->GetType(kNone), decl->GetDefaultValue(kNone), decl->GetFlavor(kNone)};
   return fDeclared.emplace(name.fText, declared).first->second;
 }
 

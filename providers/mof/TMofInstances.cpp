@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/TMofInstances.h"
 
 #include "ICIMClass.h"
@@ -18,14 +19,14 @@ namespace {
 
 constexpr std::size_t kMostNestedKeys = 8;  // the text of such a path doubles with each
 
-const TCIMContext kNone;
+TCIMContext const kNone;
 
 bool IsAlias(TMofValue const& value) { return !value.fIsArray && value.fLiterals.front().fKind == TMofLiteral::kAlias; }
 
 }  // namespace
 
 void TMofInstances::Build() {
-  const std::size_t count = fDocument.fInstances.size();
+  std::size_t const count = fDocument.fInstances.size();
   for (TMofInstanceText const& instance : fDocument.fInstances)
     Create(TMofParser(*instance.fFile, instance.fKeyword).ParseInstanceHead());
   for (std::size_t number = 0; number < count; ++number) SetPlainValues(number);
@@ -35,9 +36,9 @@ void TMofInstances::Build() {
 }
 
 void TMofInstances::Create(TMofInstance const& instance) {
-  const auto cls = AtPlace(instance.fClassName, kZEPStatusNotFound, "is no class that is declared",
+  auto const cls = AtPlace(instance.fClassName, kZEPStatusNotFound, "is no class that is declared",
                            [&] { return fNamespace->GetClass(NameAt(instance.fClassName), kNone); });
-  const auto made = AtPlace(instance.fClassName, kZEPStatusInvalidClass, "is abstract and has no instances",
+  auto const made = AtPlace(instance.fClassName, kZEPStatusInvalidClass, "is abstract and has no instances",
                             [&] { return cls->CreateInstance(kNone); });
   if (!instance.fAlias.fText.empty() && !fAliases.emplace(FoldName(NameAt(instance.fAlias)), fMade.size()).second)
     throw TMofError(instance.fAlias, NameAt(instance.fAlias) + " is the alias of another instance");
@@ -46,18 +47,18 @@ void TMofInstances::Create(TMofInstance const& instance) {
 
 void TMofInstances::SetPlainValues(std::size_t number) {
   TMofInstanceText const& text = fDocument.fInstances[number];
-  const TMofInstance instance = TMofParser(*text.fFile, text.fKeyword).ParseInstance();
+  TMofInstance const instance = TMofParser(*text.fFile, text.fKeyword).ParseInstance();
   std::set<std::string> seen;
   for (TMofAssignment const& assignment : instance.fValues) {
     if (!seen.insert(FoldName(NameAt(assignment.fName))).second)
       throw TMofError(assignment.fName, NameAt(assignment.fName) + " has a value already");
-    const auto property = PropertyOf(number, assignment.fName);
+    auto const property = PropertyOf(number, assignment.fName);
     if (IsAlias(assignment.fValue)) {
       fAliasValues.push_back({number, assignment.fName, assignment.fValue.fPlace});
       continue;
     }
-    const TCIMValue pattern = property->GetDeclaration(kNone)->GetDefaultValue(kNone);
-    const TCIMValue value = ReadMofValue(assignment.fValue, pattern.GetType(), pattern.GetMaxArraySize(), fNamespace);
+    TCIMValue const pattern = property->GetDeclaration(kNone)->GetDefaultValue(kNone);
+    TCIMValue const value = ReadMofValue(assignment.fValue, pattern.GetType(), pattern.GetMaxArraySize(), fNamespace);
     AtPlace(assignment.fName, kZEPStatusOK, "", [&] { property->SetValue(value, kNone); });
   }
 }
@@ -73,12 +74,12 @@ void TMofInstances::SetKeys(std::size_t number) {
 
 // Those among the keys, or all others.
 void TMofInstances::SetAliases(std::size_t number, bool keys) {
-  const auto isBefore = [](TAliasValue const& value, std::size_t wanted) { return value.fNumber < wanted; };
+  auto const isBefore = [](TAliasValue const& value, std::size_t wanted) { return value.fNumber < wanted; };
   auto value = std::lower_bound(fAliasValues.begin(), fAliasValues.end(), number, isBefore);
   for (; value != fAliasValues.end() && value->fNumber == number; ++value) {
-    const auto property = PropertyOf(number, value->fName);
+    auto const property = PropertyOf(number, value->fName);
     if (property->GetDeclaration(kNone)->IsKey(kNone) != keys) continue;
-    const TCIMValue path = PathOf(value->fAlias);
+    TCIMValue const path = PathOf(value->fAlias);
     AtPlace(value->fName, kZEPStatusTypeMismatch, "is no reference", [&] { property->SetValue(path, kNone); });
   }
 }
@@ -89,13 +90,13 @@ void TMofInstances::Commit(std::size_t number) {
 }
 
 boost::shared_ptr<ICIMProperty> TMofInstances::PropertyOf(std::size_t number, TMofPlace const& name) const {
-  const auto property = fMade[number].fInstance->GetProperty(NameAt(name), kNone);
+  auto const property = fMade[number].fInstance->GetProperty(NameAt(name), kNone);
   if (!property) throw TMofError(name, NameAt(name) + " is no property of the class", kZEPStatusNotFound);
   return property;
 }
 
 TCIMValue TMofInstances::PathOf(TMofPlace const& alias) {
-  const auto found = fAliases.find(FoldName(NameAt(alias)));
+  auto const found = fAliases.find(FoldName(NameAt(alias)));
   if (found == fAliases.end()) throw TMofError(alias, NameAt(alias) + " is the alias of no instance", kZEPStatusNotFound);
   if (fMade[found->second].fKeys == kBeingSet) throw TMofError(alias, NameAt(alias) + " is needed to tell its own keys");
   if (fDepth > kMostNestedKeys) throw TMofError(alias, "keys lead from one instance to another more than 8 deep");

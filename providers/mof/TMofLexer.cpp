@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/TMofLexer.h"
 
 #include "providers/memory/CIMNames.h"
@@ -65,19 +66,19 @@ void TMofLexer::SkipBlanksAndComments() {
 }
 
 void TMofLexer::SkipComment() {
-  const std::string_view rest(fNext, static_cast<std::size_t>(fEnd - fNext));
+  std::string_view const rest(fNext, static_cast<std::size_t>(fEnd - fNext));
   if (rest.substr(0, 2) == "//") {
     fNext += std::min(rest.find('\n'), rest.size());
     return;
   }
   if (rest.substr(0, 2) != "/*") Refuse(fNext + 1, "this character begins nothing that is known here");
-  const std::size_t end = rest.find("*/", 2);
+  std::size_t const end = rest.find("*/", 2);
   if (end == rest.npos) Refuse(fNext + 2, "this comment has no end");
   fNext += end + 2;
 }
 
 TMofToken TMofLexer::Take(TMofToken::EKind kind, char const* end) {
-  const std::string_view text(fNext, static_cast<std::size_t>(end - fNext));
+  std::string_view const text(fNext, static_cast<std::size_t>(end - fNext));
   fNext = end;
   return {kind, text};
 }
@@ -107,9 +108,9 @@ bool TMofLexer::IsNumber() const {
 // behind the exponent's "e" only, which in a hexadecimal number is a digit.
 char const* TMofLexer::EndOfNumber() const {
   char const* at = fNext + 1;
-  const bool isHexadecimal = fEnd - fNext > 2 && std::string_view(fNext, 3).find_first_of("xX") != std::string_view::npos;
+  bool const isHexadecimal = fEnd - fNext > 2 && std::string_view(fNext, 3).find_first_of("xX") != std::string_view::npos;
   for (; at != fEnd; ++at) {
-    const bool isBehindE = !isHexadecimal && (at[-1] == 'e' || at[-1] == 'E');
+    bool const isBehindE = !isHexadecimal && (at[-1] == 'e' || at[-1] == 'E');
     if (!IsOfName(*at) && *at != '.' && !(isBehindE && (*at == '+' || *at == '-'))) break;
   }
   return at;

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/TMofParser.h"
 
 #include "ICIMQualifierDecl.h"
@@ -42,7 +43,7 @@ constexpr TFlavorWord kFlavors[] = {
 // The types that have a name of their own, all but the reference; tag 0 for any other word.
 TType IntrinsicType(std::string_view word) {
   if (word.size() < 5 || word.size() > 8) return TType::kCIMTypeInvalid;
-  const TType type{std::string(word)};
+  TType const type{std::string(word)};
   return type == TType::kCIMTypeReference ? TType(TType::kCIMTypeInvalid) : type;
 }
 
@@ -82,10 +83,10 @@ void TMofParser::ParseClassOrInstance(TMofDocument& document) {
 // An include is read where it stands; every other pragma is passed over.
 void TMofParser::ParsePragma(TMofDocument& document, TMofSources& sources) {
   Advance();
-  const TMofPlace name = ExpectName("the name of a pragma");
+  TMofPlace const name = ExpectName("the name of a pragma");
   Expect('(');
-  const TMofPlace argument = Here();
-  const std::string text = ParseString();
+  TMofPlace const argument = Here();
+  std::string const text = ParseString();
   if (IsSameName(name.fText, "include")) {
     TMofParser(sources.OpenIncluded(text, argument)).ParseFile(document, sources);
     sources.CloseIncluded();
@@ -120,7 +121,7 @@ unsigned int TMofParser::ParseScope() {
   unsigned int scope = 0;
   if (Skip(')')) return scope;
   do {
-    const auto found = std::find_if(std::begin(kScopes), std::end(kScopes), [&](auto const& row) { return IsWord(row.fWord); });
+    auto const found = std::find_if(std::begin(kScopes), std::end(kScopes), [&](auto const& row) { return IsWord(row.fWord); });
     if (found == std::end(kScopes)) Refuse("a scope, such as \"property\" or \"any\"");
     scope |= found->fScope;
     Advance();
@@ -134,7 +135,7 @@ unsigned int TMofParser::ParseScope() {
 unsigned int TMofParser::ParseFlavor(bool inDeclaration) {
   unsigned int flavor = ICIMQualifierDecl::kFlavorDefault;
   for (bool isFirst = true;; isFirst = false) {
-    const auto found = std::find_if(std::begin(kFlavors), std::end(kFlavors), [&](auto const& row) { return IsWord(row.fWord); });
+    auto const found = std::find_if(std::begin(kFlavors), std::end(kFlavors), [&](auto const& row) { return IsWord(row.fWord); });
     if (found == std::end(kFlavors)) {
       if (isFirst) Refuse("a flavor, such as \"ToSubclass\"");
       if (fToken.fKind == TMofToken::kMark) return flavor;
@@ -221,7 +222,7 @@ TMofFeature TMofParser::ParseFeature() {
     if (!Skip(')')) ParseListUpTo(')', [&] { feature.fParameters.push_back(ParseParameter()); });
   } else if (Skip('='))
     feature.fDefault = ParseValue();
-  const bool couldGoOn = !feature.fIsMethod && !feature.fDefault;
+  bool const couldGoOn = !feature.fIsMethod && !feature.fDefault;
   if (!Skip(';')) Refuse(couldGoOn ? "\"(\", \"=\" or \";\"" : "\";\"");
   return feature;
 }
@@ -256,9 +257,9 @@ void TMofParser::ParseArrayMark(TMofType& type) {
   if (!Skip('[')) return;
   type.fType = ArrayOf(type.fType);
   if (!IsMark(']')) {
-    const std::string_view digits = fToken.fText;
-    const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), type.fMaxArraySize);
-    const bool isNumber = error == std::errc() && end == digits.data() + digits.size();
+    std::string_view const digits = fToken.fText;
+    auto const [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), type.fMaxArraySize);
+    bool const isNumber = error == std::errc() && end == digits.data() + digits.size();
     if (!isNumber || type.fMaxArraySize == 0) Refuse("\"]\" or a size of at least 1");
     Advance();
   }
@@ -267,7 +268,7 @@ void TMofParser::ParseArrayMark(TMofType& type) {
 
 TMofPlace TMofParser::ParseAlias() {
   if (!SkipWord("as")) return TMofPlace{&fFile, {}};
-  const TMofPlace alias = Here();
+  TMofPlace const alias = Here();
   if (fToken.fKind != TMofToken::kAlias) Refuse("an alias, such as \"$Disk\"");
   Advance();
   return alias;
@@ -354,7 +355,7 @@ void TMofParser::Expect(char mark) {
 
 TMofPlace TMofParser::ExpectName(char const* what) {
   if (fToken.fKind != TMofToken::kName) Refuse(what);
-  const TMofPlace name = Here();
+  TMofPlace const name = Here();
   Advance();
   return name;
 }

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/TMofSources.h"
 
 #include <fcntl.h>
@@ -26,8 +27,8 @@ EZEPStatusCode StatusOf(int error) {
 // The path without links and dots; empty, with the reason, when there is no such file, or it is no regular one.
 fs::path RegularFile(fs::path const& path, int& error) {
   std::error_code failure;
-  const fs::path canonical = fs::canonical(path, failure);
-  const bool isRegular = !failure && fs::is_regular_file(canonical, failure);
+  fs::path const canonical = fs::canonical(path, failure);
+  bool const isRegular = !failure && fs::is_regular_file(canonical, failure);
   error = failure ? failure.value() : isRegular ? 0 : fs::is_directory(canonical) ? EISDIR : EINVAL;
   return error == 0 ? canonical : fs::path();
 }
@@ -60,7 +61,7 @@ int ReadWhole(fs::path const& path, std::string& text) {
   text.resize(std::max(static_cast<std::size_t>(status.st_size) + 1, kLeast));
   std::size_t size = 0;
   for (;;) {
-    const ssize_t got = ::read(file.Get(), text.data() + size, text.size() - size);
+    ssize_t const got = ::read(file.Get(), text.data() + size, text.size() - size);
     if (got < 0) return errno;
     if (got == 0) break;
     size += static_cast<std::size_t>(got);
@@ -78,7 +79,7 @@ bool IsWithin(fs::path const& folder, fs::path const& path) {
 
 TMofFile const& TMofSources::OpenFirst(std::string const& path) {
   int error = 0;
-  const fs::path canonical = RegularFile(path, error);
+  fs::path const canonical = RegularFile(path, error);
   std::string text;
   if (error == 0) error = ReadWhole(canonical, text);
   if (error != 0) throw TMofError(path + ": cannot be read: " + ReasonOf(error), StatusOf(error));
@@ -94,10 +95,10 @@ TMofFile const& TMofSources::OpenIncluded(std::string const& name, TMofPlace con
   if (fOpen.size() >= kMostOpenFiles) throw TMofError(directive, "files include one another more than 100 deep");
 
   int error = 0;
-  const fs::path canonical = RegularFile(fOpen.back().fPath.parent_path() / name, error);
+  fs::path const canonical = RegularFile(fOpen.back().fPath.parent_path() / name, error);
   if (error == 0 && !IsWithin(fFolder, canonical))
     throw TMofError(directive, "the included file lies outside the folder of the first one", kZEPStatusAccessDenied);
-  const auto isIt = [&canonical](TOpen const& open) { return open.fPath == canonical; };
+  auto const isIt = [&canonical](TOpen const& open) { return open.fPath == canonical; };
   if (error == 0 && std::any_of(fOpen.begin(), fOpen.end(), isIt)) throw TMofError(directive, "the file includes itself");
 
   std::string text;

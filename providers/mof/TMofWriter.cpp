@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/TMofWriter.h"
 
 #include "ICIMClass.h"
@@ -22,7 +23,7 @@ namespace {
 using TType = TCIMValue::TCIMType;
 using TStaticValues = std::map<std::string, TCIMValue>;  // by name in small letters
 
-const TCIMContext kNone;
+TCIMContext const kNone;
 
 std::vector<std::string> ScopeWords(unsigned int scope) {
   constexpr char const* kWords[] = {"class", "association", "indication", "property", "reference", "method", "parameter"};
@@ -49,13 +50,13 @@ std::string ArrayMark(TType type, unsigned int maxArraySize) {
 
 std::string TypeText(TType type, std::string const& referencedClass) {
   if (BaseTypeOf(type) != TType::kCIMTypeReference) return type.ToString();
-  const TType sameName(referencedClass);  // a class that is called as a type would be taken for it
+  TType const sameName(referencedClass);  // a class that is called as a type would be taken for it
   if (referencedClass.empty() || HasTypeName(sameName)) ThrowUnprintable();
   return referencedClass + " REF";
 }
 
 std::string ReferencedClassOf(TCIMValue const& value) {
-  const boost::shared_ptr<ICIMClass> cls = value.GetReferencedClass();
+  boost::shared_ptr<ICIMClass> const cls = value.GetReferencedClass();
   return cls ? cls->GetName(kNone) : "";
 }
 
@@ -64,9 +65,9 @@ bool IsTrue(TCIMValue const& value) {
 }
 
 std::string QualifierText(ICIMQualifier const& qualifier, std::size_t indent) {
-  const std::string name = qualifier.GetName(kNone);
-  const TCIMValue value = qualifier.GetValue(kNone);
-  const unsigned int flavor = qualifier.GetFlavor(kNone);
+  std::string const name = qualifier.GetName(kNone);
+  TCIMValue const value = qualifier.GetValue(kNone);
+  unsigned int const flavor = qualifier.GetFlavor(kNone);
   std::string text = name;
   if (value.IsArray() && !value.IsNull())
     text += " " + MofValueText(value, indent + name.size() + 1, indent + 4);
@@ -80,7 +81,7 @@ TStaticValues StaticValuesOf(ICIMClass const& cls) {
   TStaticValues values;
   cls.EnumerateStaticProperties(
       [&](boost::shared_ptr<ICIMProperty> property) {
-        const TCIMValue value = property->GetValue(kNone);
+        TCIMValue const value = property->GetValue(kNone);
         if (!value.IsNull()) values.emplace(FoldName(property->GetName(kNone)), value);
         return true;
       },
@@ -89,18 +90,18 @@ TStaticValues StaticValuesOf(ICIMClass const& cls) {
 }
 
 bool IsStatic(ICIMPropertyDecl const& property) {
-  const boost::shared_ptr<ICIMQualifier> qualifier = property.GetQualifier("Static", kNone);
+  boost::shared_ptr<ICIMQualifier> const qualifier = property.GetQualifier("Static", kNone);
   return qualifier && IsTrue(qualifier->GetValue(kNone));
 }
 
 // What stands behind the property's "=": its static value, which is taken out of `statics`, or its default.
 TCIMValue TakeInitialValue(ICIMPropertyDecl const& property, TStaticValues& statics) {
-  const TCIMValue defaultValue = property.GetDefaultValue(kNone);
-  const auto found = statics.find(FoldName(property.GetName(kNone)));
-  const bool hasStaticValue = found != statics.end();
+  TCIMValue const defaultValue = property.GetDefaultValue(kNone);
+  auto const found = statics.find(FoldName(property.GetName(kNone)));
+  bool const hasStaticValue = found != statics.end();
   if (IsStatic(property) ? !defaultValue.IsNull() : hasStaticValue) ThrowUnprintable();
   if (!hasStaticValue) return defaultValue;
-  const TCIMValue value = found->second;
+  TCIMValue const value = found->second;
   statics.erase(found);
   return value;
 }
@@ -108,8 +109,8 @@ TCIMValue TakeInitialValue(ICIMPropertyDecl const& property, TStaticValues& stat
 }  // namespace
 
 void TMofWriter::WriteQualifierDecl(ICIMQualifierDecl const& decl) {
-  const TType type = decl.GetType(kNone);
-  const TCIMValue value = decl.GetDefaultValue(kNone);
+  TType const type = decl.GetType(kNone);
+  TCIMValue const value = decl.GetDefaultValue(kNone);
   fText += "Qualifier " + decl.GetName(kNone) + " : " + type.ToString() + ArrayMark(type, value.GetMaxArraySize());
   if (!value.IsNull()) fText += " = " + MofValueText(value, 0, 4);
   fText += ",\n    Scope(" + MofList(ScopeWords(decl.GetScope(kNone)), 10, 10) + ")";
@@ -152,9 +153,9 @@ void TMofWriter::WriteQualifiers(ICIMNamedElement const& element, std::size_t in
 void TMofWriter::WriteProperty(ICIMPropertyDecl const& property, TCIMValue const& initial) {
   fText += "\n";
   WriteQualifiers(property, 2);
-  const TType type = property.GetType(kNone);
+  TType const type = property.GetType(kNone);
   if (type == ArrayOf(TType::kCIMTypeReference)) ThrowUnprintable();
-  const std::string head = "  " + TypeText(type, ReferencedClassOf(initial)) + " " + property.GetName(kNone) +
+  std::string const head = "  " + TypeText(type, ReferencedClassOf(initial)) + " " + property.GetName(kNone) +
                            ArrayMark(type, initial.GetMaxArraySize());
   fText += head;
   if (!initial.IsNull()) fText += " = " + MofValueText(initial, head.size() + 3, 6);
@@ -164,7 +165,7 @@ void TMofWriter::WriteProperty(ICIMPropertyDecl const& property, TCIMValue const
 void TMofWriter::WriteMethod(ICIMMethodDecl const& method) {
   fText += "\n";
   WriteQualifiers(method, 2);
-  const TType type = method.GetReturnType(kNone);
+  TType const type = method.GetReturnType(kNone);
   if (type == TType::kCIMTypeReference) ThrowUnprintable();
   fText += "  " + type.ToString() + " " + method.GetName(kNone) + "(";
   char const* before = "\n";
@@ -181,7 +182,7 @@ void TMofWriter::WriteMethod(ICIMMethodDecl const& method) {
 
 void TMofWriter::WriteParameter(ICIMParameterDecl const& parameter) {
   WriteQualifiers(parameter, 4);
-  const TType type = parameter.GetType(kNone);
+  TType const type = parameter.GetType(kNone);
   fText += "    " + TypeText(type, parameter.GetReferencedClassName(kNone)) + " " + parameter.GetName(kNone) +
            ArrayMark(type, parameter.GetMaxArraySize(kNone));
 }
@@ -190,9 +191,9 @@ void TMofWriter::WriteInstance(ICIMInstance const& instance) {
   fText += "instance of " + instance.GetClass(kNone)->GetName(kNone) + " {\n";
   instance.EnumerateProperties(
       [&](boost::shared_ptr<ICIMProperty> property) {
-        const TCIMValue value = property->GetValue(kNone);
-        const bool isPlainNull = value.IsNull() && property->GetDeclaration(kNone)->GetDefaultValue(kNone).IsNull();
-        const std::string head = "  " + property->GetName(kNone) + " = ";
+        TCIMValue const value = property->GetValue(kNone);
+        bool const isPlainNull = value.IsNull() && property->GetDeclaration(kNone)->GetDefaultValue(kNone).IsNull();
+        std::string const head = "  " + property->GetName(kNone) + " = ";
         if (!isPlainNull) fText += head + MofValueText(value, head.size(), 6) + ";\n";
         return true;
       },

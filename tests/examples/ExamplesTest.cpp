@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The examples do what the documentation says, and the documentation shows the code of the examples.
 
 #include "TOSSpecific.h"
@@ -24,18 +26,18 @@ class ClockTest : public testing::Test {
 protected:
   static void SetUpTestSuite() { TOSSpecific::LoadPluginLibrary(ZEP_CLOCK_PLUGIN); }
 
-  ClockTest() : ns_(TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Clock")->GetNamespace(kNone)) {}
+  ClockTest() : fNs(TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Clock")->GetNamespace(kNone)) {}
 
   boost::shared_ptr<ICIMInstance> Find(std::string const& path) const {
-    return ns_->GetInstance(TCIMReference(ns_, "ns:" + path, kNone), kNone);
+    return fNs->GetInstance(TCIMReference(fNs, "ns:" + path, kNone), kNone);
   }
 
-  boost::shared_ptr<ICIMNamespace> const ns_;
+  boost::shared_ptr<ICIMNamespace> const fNs;
 };
 
 TEST_F(ClockTest, RegistersItselfWithItsNamespace) {
-  EXPECT_EQ(ns_->GetName(kNone), "root/clock");
-  EXPECT_EQ(TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Clock")->GetNamespace(kNone), ns_);
+  EXPECT_EQ(fNs->GetName(kNone), "root/clock");
+  EXPECT_EQ(TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Clock")->GetNamespace(kNone), fNs);
 }
 
 TEST_F(ClockTest, TellsOfEachClock) {
@@ -55,7 +57,7 @@ TEST_F(ClockTest, TellsOfEachClock) {
 
 TEST_F(ClockTest, AssociatesClocks) {
   std::vector<boost::shared_ptr<ICIMInstance>> associations;
-  ns_->GetClass("X_RunsAtTheRateOf", kNone)->EnumerateInstances(TAddToVectorCallback<ICIMInstance>(associations), kNone);
+  fNs->GetClass("X_RunsAtTheRateOf", kNone)->EnumerateInstances(TAddToVectorCallback<ICIMInstance>(associations), kNone);
   ASSERT_EQ(associations.size(), 1u);
   TCIMReference const leader = associations[0]->GetProperty("Leader", kNone)->GetValue(kNone);
   EXPECT_EQ(leader.GetCIMElement(false), Find("X_Clock.Name=\"realtime\""));

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Rules for the complete source tree: which room may include which, and what libzepcore.so exports.
 
 #include "tests/Support.h"

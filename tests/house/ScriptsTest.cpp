@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // What the scripts say where they cannot go on.
 
 #include "tests/Support.h"
@@ -14,19 +16,19 @@ class ScriptsTest : public testing::Test {
 protected:
   // A program that the scripts find: a script of one line.
   void Program(std::string const& name, std::string const& line) {
-    WriteFile(dir_.Path(name), "#!/bin/bash\n" + line + "\n");
-    fs::permissions(dir_.Path(name), fs::perms::owner_all);
+    WriteFile(fDir.Path(name), "#!/bin/bash\n" + line + "\n");
+    fs::permissions(fDir.Path(name), fs::perms::owner_all);
   }
 
   // scripts/lib.sh and a function of it, with no programs but those of the test, sed and dirname.
   TProgramRun Run(std::string const& function) {
     for (char const* program : {"sed", "dirname", "grep"})
-      fs::create_symlink(std::string("/usr/bin/") + program, dir_.Path(program));
-    return RunProgram("PATH=" + dir_.Path() + " /bin/bash -c 'set -euo pipefail; source " ZEP_SOURCE_DIR "/scripts/lib.sh; " +
+      fs::create_symlink(std::string("/usr/bin/") + program, fDir.Path(program));
+    return RunProgram("PATH=" + fDir.Path() + " /bin/bash -c 'set -euo pipefail; source " ZEP_SOURCE_DIR "/scripts/lib.sh; " +
                       function + "' 2>&1");
   }
 
-  TTempDir dir_;
+  TTempDir fDir;
 };
 
 TEST_F(ScriptsTest, PackagesThatOnlyRootCanInstallAreNamedWhereThereIsNoSudo) {

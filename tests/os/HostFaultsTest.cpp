@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Every call of the C library that a host service makes fails in turn (tests/os/faults): what the operation reports then,
 // and that it leaves nothing behind and comes to an end.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TCommUtil.h"
 #include "TOSSpecific.h"
 #include "tests/Support.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Copies, lists, finds, makes and deletes files, and opens streams on them.
 
 #include "TOSSpecific.h"

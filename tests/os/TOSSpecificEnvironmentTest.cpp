@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The working directory, the environment, and paths below another.
 
 #include "TOSSpecific.h"

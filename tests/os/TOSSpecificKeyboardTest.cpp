@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The keyboard on a real pseudo terminal, the sleep, who and where we are, and the two flags.
 
 #include "TOSSpecific.h"

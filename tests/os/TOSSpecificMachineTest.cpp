@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TOSSpecific.h"
 
 #include "tests/LogOf.h"
@@ -18,13 +19,13 @@ using testing::ElementsAre;
 class TOSSpecificMachineTest : public testing::Test {
 protected:
   void UseTable(std::string const& table) {
-    WriteFile(dir_.Path("table"), table);
-    ::setenv("ZEP_SMBIOS_TABLE", dir_.Path("table").c_str(), 1);
+    WriteFile(fDir.Path("table"), table);
+    ::setenv("ZEP_SMBIOS_TABLE", fDir.Path("table").c_str(), 1);
   }
-  void UseNoTable() { ::setenv("ZEP_SMBIOS_TABLE", dir_.Path("absent").c_str(), 1); }
+  void UseNoTable() { ::setenv("ZEP_SMBIOS_TABLE", fDir.Path("absent").c_str(), 1); }
 
-  TTempDir dir_;
-  TEnvironmentGuard const variable_{"ZEP_SMBIOS_TABLE", nullptr};  // puts it back
+  TTempDir fDir;
+  TEnvironmentGuard const fVariable{"ZEP_SMBIOS_TABLE", nullptr};  // puts it back
 };
 
 struct TIdentityRow {
@@ -359,7 +360,7 @@ protected:
   // Runs the operation in a process whose loader looks in `libraryDir` first and then in `coreDir`.
   TProbeRun Run(std::string const& operation, std::string const& environment = "",
                 std::string const& libraryDir = ZEP_STANDIN_DIR "/whole", std::string const& coreDir = ZEP_BUILD_DIR "/lib") {
-    std::string const record = dir_.Path("record");
+    std::string const record = fDir.Path("record");
     WriteFile(record, "");
     std::istringstream output(OutputOfCommand("LD_LIBRARY_PATH=" + libraryDir + ":" + coreDir + " STANDIN_RECORD=" + record +
                                               " " + environment + " " ZEP_IDENTITY_PROBE " " + operation));
@@ -372,11 +373,11 @@ protected:
   }
 
   std::string StructureFile(std::string const& structure) {
-    WriteFile(dir_.Path("structure"), structure);
-    return "STANDIN_STRUCTURE=" + dir_.Path("structure") + " ";
+    WriteFile(fDir.Path("structure"), structure);
+    return "STANDIN_STRUCTURE=" + fDir.Path("structure") + " ";
   }
 
-  TTempDir dir_;
+  TTempDir fDir;
 };
 
 std::string const kLoaded = "smBiosLoad(null)";
@@ -526,20 +527,20 @@ TEST_F(SmbiosStandInTest, ALibraryWithoutOneOfTheFunctionsIsNotFound) {
 }
 
 TEST_F(SmbiosStandInTest, AFileThatIsNoLibraryCannotBeOpened) {
-  WriteFile(dir_.Path("libsmbios.so"), "not a library");
-  TProbeRun const run = Run("GetBiosID", "", dir_.Path());
+  WriteFile(fDir.Path("libsmbios.so"), "not a library");
+  TProbeRun const run = Run("GetBiosID", "", fDir.Path());
   EXPECT_EQ(run.result, "00");
   EXPECT_THAT(run.log, ElementsAre("[Debug] GetBiosID: Unable to open SMBIOS lib error = 11"));
 }
 
 TEST_F(SmbiosStandInTest, WithoutThePlatformLibraryTheDefaultsAreGiven) {
-  std::filesystem::copy(ZEP_BUILD_DIR "/lib/libzepcore.so", dir_.Path("libzepcore.so"));
+  std::filesystem::copy(ZEP_BUILD_DIR "/lib/libzepcore.so", fDir.Path("libzepcore.so"));
   for (auto const& [operation, result] :
        {std::pair("GetMachineType", "0000"), std::pair("GetMachineTypeFromID", "0000"), std::pair("GetBiosID", "00"),
         std::pair("type", "0000"), std::pair("name", "Unknown"), std::pair("model", "Unknown"), std::pair("SN", "Unknown"),
         std::pair("Type", "error param of GetMachineInfo")}) {
     SCOPED_TRACE(operation);
-    TProbeRun const run = Run(operation, "", dir_.Path(), dir_.Path());
+    TProbeRun const run = Run(operation, "", fDir.Path(), fDir.Path());
     EXPECT_EQ(run.result, result);
     bool const isBios = std::string("GetBiosID") == operation;
     EXPECT_THAT(run.log, Contains(isBios ? "[Debug] GetBiosID: Unable to open SMBIOS lib error = 11"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TOSSpecific.h"
 #include "tests/cim/model/Fakes.h"
 #include "tests/os/FakeShell.h"
@@ -121,19 +122,19 @@ class StandInTest : public testing::Test {
 protected:
   // A script of the shell that writes down how it was called, and then does as told.
   void Add(std::string const& name, std::string const& body) {
-    WriteFile(dir_.Path(name), "#!/bin/sh\necho \"" + name + " $*\" >> " + dir_.Path("calls") + "\n" + body + "\n");
-    fs::permissions(dir_.Path(name), fs::perms::all);
+    WriteFile(fDir.Path(name), "#!/bin/sh\necho \"" + name + " $*\" >> " + fDir.Path("calls") + "\n" + body + "\n");
+    fs::permissions(fDir.Path(name), fs::perms::all);
   }
 
   TLines Calls() const {
     TLines calls;
-    std::istringstream text(ReadFile(dir_.Path("calls")));
+    std::istringstream text(ReadFile(fDir.Path("calls")));
     for (std::string line; std::getline(text, line);) calls.push_back(line);
     return calls;
   }
 
-  TTempDir dir_;
-  TEnvironmentGuard const path_{"PATH", (dir_.Path() + ":/usr/bin:/bin").c_str()};
+  TTempDir fDir;
+  TEnvironmentGuard const fPath{"PATH", (fDir.Path() + ":/usr/bin:/bin").c_str()};
 };
 
 TEST_F(StandInTest, MountIsAskedAndThenMounts) {
@@ -158,7 +159,7 @@ TEST_F(StandInTest, AMountedKeyIsFoundInTheListOfMounts) {
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.line);
-    fs::remove(dir_.Path("calls"));
+    fs::remove(fDir.Path("calls"));
     Add("mount", std::string("test $# = 0 && echo '") + row.line + "' || exit 1");
     if (row.isMounted) {
       TOSSpecific::MountDevice(row.device);
@@ -174,12 +175,12 @@ TEST_F(StandInTest, WhatTheCommandsComplainOfIsNotSeen) {
   Add("mount", "echo complaint >&2; exit 1");
   Add("umount", "echo complaint >&2; exit 1");
   Add("grep", "exit 1");
-  fs::create_directory(dir_.Path("seen"));
+  fs::create_directory(fDir.Path("seen"));
   std::string const seen = InChild([&] {
-    if (::freopen(dir_.Path("seen/errors").c_str(), "w", stderr) == nullptr) return std::string("no file");
+    if (::freopen(fDir.Path("seen/errors").c_str(), "w", stderr) == nullptr) return std::string("no file");
     EXPECT_STATUS(TOSSpecific::UnmountDevice("/dev/sdb", "/mnt/key"), kZEPStatusFileSystemError);
     EXPECT_STATUS(TOSSpecific::MountDevice("/dev/sdb"), kZEPStatusFileSystemError);
-    return ReadFile(dir_.Path("seen/errors"));
+    return ReadFile(fDir.Path("seen/errors"));
   });
   // Only that of listing the mounts is not redirected. Kept.
   EXPECT_EQ(seen, "complaint\n");
@@ -209,7 +210,7 @@ TEST_F(StandInTest, VirtualDevicesOfRealTexts) {
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.option);
-    fs::remove(dir_.Path("calls"));
+    fs::remove(fDir.Path("calls"));
     EXPECT_THAT(VirtualDevices(row.kind, true), ElementsAre(row.whole));
     EXPECT_THAT(VirtualDevices(row.kind, false), ElementsAre(row.cut));
     std::string const call = std::string("hwinfo ") + row.option;
@@ -218,14 +219,14 @@ TEST_F(StandInTest, VirtualDevicesOfRealTexts) {
 }
 
 TEST_F(StandInTest, EachKindHasItsHeaderAndMarker) {
-  Add("hwinfo", "cat " + dir_.Path("text"));
+  Add("hwinfo", "cat " + fDir.Path("text"));
   char const* const headers[] = {"disk", "cdrom", "keyboard", "mouse"};
   char const* const markers[] = {"Virtual", "0x4012"};
   for (int kind = 0; kind < 4; ++kind)
     for (std::string const header : headers)
       for (std::string const marker : markers) {
         SCOPED_TRACE(std::to_string(kind) + " " + header + " " + marker);
-        WriteFile(dir_.Path("text"),
+        WriteFile(fDir.Path("text"),
                   "  Hardware Class: " + header + "\n  Device: " + marker + "\n  Device File: /dev/x (/dev/y)\n");
         bool const isFound = header == headers[kind] && marker == markers[kind == 0 ? 0 : 1];
         EXPECT_EQ(VirtualDevices(kind, false), isFound ? TLines{"/dev/x"} : TLines{});
@@ -233,11 +234,11 @@ TEST_F(StandInTest, EachKindHasItsHeaderAndMarker) {
 }
 
 TEST_F(StandInTest, VirtualDevicesAreAppendedInTheOrderOfTheOutput) {
-  WriteFile(dir_.Path("text"),
+  WriteFile(fDir.Path("text"),
             "Hardware Class: disk\nModel: Virtual A\nDevice File: /dev/sdd (/dev/sg3)\n\n"
             "Hardware Class: disk\nModel: Real\nDevice File: /dev/sda (/dev/sg0)\n\n"
             "Hardware Class: disk\nModel: Virtual B\nDevice File: /dev/sdb\n");
-  Add("hwinfo", "cat " + dir_.Path("text"));
+  Add("hwinfo", "cat " + fDir.Path("text"));
   TLines devices = {"old"};
   TOSSpecific::getxBMCVirtualDevices(0, devices, true);
   TOSSpecific::getxBMCVirtualDevices(0, devices, false);
@@ -278,14 +279,14 @@ TEST_F(StandInTest, OnlyTheSpawningIsLogged) {
 }
 
 TEST_F(StandInTest, AHangingHwinfoIsLeftAloneAfterThreeHundredSecondsOfSilence) {
-  Add("hwinfo", "echo $$ > " + dir_.Path("pid") + "; cat " + PathOfSample("disk.txt") + "; exec sleep 60");
+  Add("hwinfo", "echo $$ > " + fDir.Path("pid") + "; cat " + PathOfSample("disk.txt") + "; exec sleep 60");
   TFastSelect const time;
   TLines devices;
   TLines const log = LogOf([&] { devices = VirtualDevices(0, false); });
   EXPECT_THAT(devices, ElementsAre("/dev/sdc"));
   EXPECT_THAT(time.Seconds(), testing::Each(300));
   EXPECT_THAT(log, ElementsAre("[Debug] SpawnProcess: process hwinfo", "[Debug] ERROR: SpawnProcess - hwinfo TimeOut!"));
-  pid_t const child = std::stoi(ReadFile(dir_.Path("pid")));
+  pid_t const child = std::stoi(ReadFile(fDir.Path("pid")));
   EXPECT_EQ(::waitpid(child, nullptr, WNOHANG), 0);  // it still runs
   ::kill(child, SIGKILL);
   EXPECT_EQ(::waitpid(child, nullptr, 0), child);

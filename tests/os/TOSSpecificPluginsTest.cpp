@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TOSSpecific.h"
 
 #include "TLogger.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The identity of a remote server, with a stand-in for the IPMI client library, and the files of debug sessions.
 
 #include "TOSSpecific.h"
@@ -44,12 +46,12 @@ class RemoteIdentityTest : public testing::Test {
 protected:
   // Calls the operation with the answer given.
   std::string ResultOf(TRemoteOperation operation, std::string const& answer, int length = -1) {
-    standIn_.response = answer;
-    standIn_.responseLength = length;
+    fStandIn.response = answer;
+    fStandIn.responseLength = length;
     return operation("bmc.example", "zepadmin", "secret");
   }
 
-  TStandInIpmiClient& standIn_ = LoadStandInIpmiClient();
+  TStandInIpmiClient& fStandIn = LoadStandInIpmiClient();
 };
 
 TEST_F(RemoteIdentityTest, EachOperationReadsItsPartOfTheFruData) {
@@ -138,7 +140,7 @@ TEST_F(RemoteIdentityTest, WithoutASessionTheResultIsEmptyAndNothingIsAsked) {
   for (int result : {1, -1, 1000})
     for (TOperation const& operation : kOperations) {
       SCOPED_TRACE(operation.name);
-      standIn_.openResult = result;
+      fStandIn.openResult = result;
       EXPECT_THAT(LogOf([&] { EXPECT_EQ(ResultOf(operation.call, Answer("1234AB7")), ""); }), ElementsAre(kOpened));
     }
 }
@@ -147,7 +149,7 @@ TEST_F(RemoteIdentityTest, AFailedCommandGivesNotAvailable) {
   for (int result : {1, -1, 1000})
     for (TOperation const& operation : kOperations) {
       SCOPED_TRACE(operation.name);
-      standIn_.sendResult = result;
+      fStandIn.sendResult = result;
       EXPECT_THAT(LogOf([&] { EXPECT_EQ(ResultOf(operation.call, Answer("1234AB7")), "N/A"); }),
                   ElementsAre(kOpened, Sent(operation)));
     }
@@ -172,24 +174,24 @@ TEST(RemoteIdentityWithoutAFunctionTest, ClosingIsNotNeeded) {
 
 class SetDebugLevelTest : public testing::Test {
 protected:
-  SetDebugLevelTest() : directory_(std::filesystem::current_path()) { std::filesystem::current_path(dir_.Path()); }
+  SetDebugLevelTest() : fDirectory(std::filesystem::current_path()) { std::filesystem::current_path(fDir.Path()); }
   ~SetDebugLevelTest() override {
-    std::filesystem::current_path(directory_);
+    std::filesystem::current_path(fDirectory);
     TLogger::SetLogThreshold(ILogger::kLogStatus);
   }
 
   void UseTable(std::string const& table) {
-    WriteFile(dir_.Path("table"), table);
-    ::setenv("ZEP_SMBIOS_TABLE", dir_.Path("table").c_str(), 1);
+    WriteFile(fDir.Path("table"), table);
+    ::setenv("ZEP_SMBIOS_TABLE", fDir.Path("table").c_str(), 1);
   }
 
   bool SetDebugLevel(int level, std::string path) { return TOSSpecific::SetDebugLevel(level, path.data()); }
 
   static ILogger::EZEPLogSeverity Threshold() { return TLogger::GetInstance()->GetLogThreshold(); }
 
-  TTempDir dir_;
-  std::filesystem::path const directory_;
-  TEnvironmentGuard const table_{"ZEP_SMBIOS_TABLE", "/nonexistent"}, zone_{"TZ", "UTC0"};
+  TTempDir fDir;
+  std::filesystem::path const fDirectory;
+  TEnvironmentGuard const fTable{"ZEP_SMBIOS_TABLE", "/nonexistent"}, fZone{"TZ", "UTC0"};
 };
 
 std::vector<TFakeClock::TTime> const k3March2024 = {{2024, 3, 3, 9, 5, 7}};
@@ -197,9 +199,9 @@ std::vector<TFakeClock::TTime> const k3March2024 = {{2024, 3, 3, 9, 5, 7}};
 TEST_F(SetDebugLevelTest, MakesAFileNamedByTypeAndTime) {
   TFakeClock const clock(k3March2024);
   UseTable(RealTable("full"));
-  EXPECT_TRUE(SetDebugLevel(2, dir_.Path("zep_")));
-  EXPECT_TRUE(std::filesystem::exists(dir_.Path("zep_123420240303-090507.log")));
-  EXPECT_EQ(std::filesystem::file_size(dir_.Path("zep_123420240303-090507.log")), 0u);
+  EXPECT_TRUE(SetDebugLevel(2, fDir.Path("zep_")));
+  EXPECT_TRUE(std::filesystem::exists(fDir.Path("zep_123420240303-090507.log")));
+  EXPECT_EQ(std::filesystem::file_size(fDir.Path("zep_123420240303-090507.log")), 0u);
 }
 
 TEST_F(SetDebugLevelTest, TheTimeIsLocal) {
@@ -240,14 +242,14 @@ TEST_F(SetDebugLevelTest, OnlyTheLevels0To4AreSet) {
 }
 
 TEST_F(SetDebugLevelTest, AFileThatCannotBeMadeGoesUnnoticed) {
-  EXPECT_TRUE(SetDebugLevel(1, dir_.Path("absent/zep_")));
+  EXPECT_TRUE(SetDebugLevel(1, fDir.Path("absent/zep_")));
   EXPECT_EQ(Threshold(), ILogger::kLogWarning);
-  EXPECT_FALSE(SetDebugLevel(7, dir_.Path("absent/zep_")));
+  EXPECT_FALSE(SetDebugLevel(7, fDir.Path("absent/zep_")));
 }
 
 TEST_F(SetDebugLevelTest, ThePathIsCutOffAfter255Bytes) {
   TFakeClock const clock(k3March2024);
-  std::string const room = dir_.Path("");  // with its separator
+  std::string const room = fDir.Path("");  // with its separator
   SetDebugLevel(2, room + std::string(255 - room.size(), 'x') + "yyy");
   EXPECT_TRUE(std::filesystem::exists(room + std::string(255 - room.size(), 'x')));
   SetDebugLevel(2, room + std::string(250 - room.size(), 'z'));
@@ -258,7 +260,7 @@ TEST_F(SetDebugLevelTest, ThePathIsCutOffAfter255Bytes) {
 
 TEST_F(SetDebugLevelTest, ReadsTheMachineTypeBeforeTheThresholdChanges) {
   UseTable(RealTable("full"));
-  EXPECT_THAT(LogOf([&] { SetDebugLevel(0, dir_.Path("zep_")); }),
+  EXPECT_THAT(LogOf([&] { SetDebugLevel(0, fDir.Path("zep_")); }),
               ElementsAre("[Debug] getMachineType() entered.", "[Debug] Machine type detected: 1234",
                           "[Debug] getMachineType() completed."));
 }
@@ -267,8 +269,8 @@ TEST_F(SetDebugLevelTest, APathThatIsGivenCountsInBothVariants) {
   TFakeClock const clock(k3March2024);
   std::filesystem::create_directory("docs");
   WriteFile("docs/oem_zep_preboot_readme.txt", "");
-  EXPECT_TRUE(SetDebugLevel(2, dir_.Path("zep_")));
-  EXPECT_TRUE(std::filesystem::exists(dir_.Path("zep_000020240303-090507.log")));
+  EXPECT_TRUE(SetDebugLevel(2, fDir.Path("zep_")));
+  EXPECT_TRUE(std::filesystem::exists(fDir.Path("zep_000020240303-090507.log")));
 }
 
 // Without a path the file lies in a directory of the system. Tests do not write there: they look at a tree of their own.
@@ -276,8 +278,8 @@ TEST_F(SetDebugLevelTest, WithoutAPathTheVariantNamesTheDirectory) {
   NEEDS(::geteuid() == 0, "root, for a mount namespace");
   for (bool isOEM : {false, true}) {
     SCOPED_TRACE(isOEM);
-    std::string const program = dir_.Path("in-namespace");
-    std::string const made = dir_.Path(isOEM ? "made-oem" : "made");
+    std::string const program = fDir.Path("in-namespace");
+    std::string const made = fDir.Path(isOEM ? "made-oem" : "made");
     if (isOEM) {
       std::filesystem::create_directory("docs");
       WriteFile("docs/oem_zep_preboot_readme.txt", "");

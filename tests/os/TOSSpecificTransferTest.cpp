@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // File transfer with a stand-in for libcurl (tests/os/curl): which options are set, in which order and to what, and what
 // becomes of each failure. Real servers: tests/system/transfer.
 
@@ -63,49 +65,49 @@ TLines Joined(TLines a, TLines const& b, TLines const& c) {
 
 class TransferTest : public testing::Test {
 protected:
-  TTempDir dir_;
-  std::string const file_ = dir_.Path("file");
-  TCurlRecord record_;
+  TTempDir fDir;
+  std::string const fFile = fDir.Path("file");
+  TCurlRecord fRecord;
 };
 
 TEST_F(TransferTest, DownloadSetsItsOptionsInOrder) {
-  record_.chunks = {"first ", "second"};
-  record_.fileToWatch = file_;
+  fRecord.chunks = {"first ", "second"};
+  fRecord.fileToWatch = fFile;
   TLines log;
-  WithStandIn(record_, [&] { log = LogOf([&] { TOSSpecific::CurlTransferFile("ftp://h/a b?c", file_, true); }); });
-  EXPECT_THAT(record_.calls,
+  WithStandIn(fRecord, [&] { log = LogOf([&] { TOSSpecific::CurlTransferFile("ftp://h/a b?c", fFile, true); }); });
+  EXPECT_THAT(fRecord.calls,
               ElementsAreArray(Joined(kStart,
                                       {"setopt WRITEFUNCTION function", "setopt WRITEDATA context", "setopt URL 'ftp://h/a b?c'",
                                        "setopt FTP_CREATE_MISSING_DIRS 1", "perform", "write 6 file 6", "write 6 file 12"},
                                       kEnd)));
-  EXPECT_EQ(ReadFile(file_), "first second");
-  EXPECT_EQ(record_.errorTextAtStart, "");
+  EXPECT_EQ(ReadFile(fFile), "first second");
+  EXPECT_EQ(fRecord.errorTextAtStart, "");
   EXPECT_THAT(log, IsEmpty());
 }
 
 TEST_F(TransferTest, UploadSetsItsOptionsInOrder) {
   std::string const text = std::string("a\0b\r\n", 5) + std::string(100000, 'x');
-  WriteFile(file_, text);
+  WriteFile(fFile, text);
   TLines log;
-  WithStandIn(record_, [&] { log = LogOf([&] { TOSSpecific::CurlTransferFile("sftp://h/f", file_, false); }); });
-  EXPECT_THAT(record_.calls, ElementsAreArray(Joined(kStart,
+  WithStandIn(fRecord, [&] { log = LogOf([&] { TOSSpecific::CurlTransferFile("sftp://h/f", fFile, false); }); });
+  EXPECT_THAT(fRecord.calls, ElementsAreArray(Joined(kStart,
                                                      {"setopt UPLOAD 1", "setopt URL 'sftp://h/f'", "setopt READDATA stream",
                                                       "setopt FTP_CREATE_MISSING_DIRS 1", "perform"},
                                                      kEnd)));
-  EXPECT_EQ(record_.uploaded, text);
+  EXPECT_EQ(fRecord.uploaded, text);
   EXPECT_THAT(log, IsEmpty());
 }
 
 TEST_F(TransferTest, AnEmptyDownloadLeavesNoFile) {
-  WithStandIn(record_, [&] { TOSSpecific::CurlTransferFile("ftp://h/f", file_, true); });
-  EXPECT_FALSE(fs::exists(file_));
+  WithStandIn(fRecord, [&] { TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true); });
+  EXPECT_FALSE(fs::exists(fFile));
 }
 
 TEST_F(TransferTest, AnEmptyFileIsUploaded) {
-  WriteFile(file_, "");
-  WithStandIn(record_, [&] { TOSSpecific::CurlTransferFile("ftp://h/f", file_, false); });
-  EXPECT_THAT(record_.calls, testing::Contains("perform"));
-  EXPECT_EQ(record_.uploaded, "");
+  WriteFile(fFile, "");
+  WithStandIn(fRecord, [&] { TOSSpecific::CurlTransferFile("ftp://h/f", fFile, false); });
+  EXPECT_THAT(fRecord.calls, testing::Contains("perform"));
+  EXPECT_EQ(fRecord.uploaded, "");
 }
 
 struct TRefusal {
@@ -138,12 +140,12 @@ TEST_F(TransferTest, ARefusedOptionEndsADownload) {
                   {10002, "TOSSpecific|CurlTransferFile: Error setting curl target", "setopt URL 'ftp://h/f'"},
                   {110, "TOSSpecific|CurlTransferFile: Error setting curl option: CURLOPT_FTP_CREATE_MISSING_DIRS",
                    "setopt FTP_CREATE_MISSING_DIRS 1"}},
-                 [&] { TOSSpecific::CurlTransferFile("ftp://h/f", file_, true); });
-  EXPECT_FALSE(fs::exists(file_));
+                 [&] { TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true); });
+  EXPECT_FALSE(fs::exists(fFile));
 }
 
 TEST_F(TransferTest, ARefusedOptionEndsAnUpload) {
-  WriteFile(file_, "text");
+  WriteFile(fFile, "text");
   ExpectRefusals({{10010, "TOSSpecific|CurlTransferFile: Error configuring curl error buffer", "setopt ERRORBUFFER buffer"},
                   {85, "TOSSpecific|CurlTransferFile: Error configuring curl passive mode", "setopt FTP_USE_EPSV 0"},
                   {10004, "TOSSpecific|CurlTransferFile: Error configuring curl proxy server", "setopt PROXY ''"},
@@ -152,30 +154,30 @@ TEST_F(TransferTest, ARefusedOptionEndsAnUpload) {
                   {10009, "TOSSpecific|CurlTransferFile: Error setting curl upload file", "setopt READDATA stream"},
                   {110, "TOSSpecific|CurlTransferFile: Error setting curl option: CURLOPT_FTP_CREATE_MISSING_DIRS",
                    "setopt FTP_CREATE_MISSING_DIRS 1"}},
-                 [&] { TOSSpecific::CurlTransferFile("ftp://h/f", file_, false); });
+                 [&] { TOSSpecific::CurlTransferFile("ftp://h/f", fFile, false); });
 }
 
 TEST_F(TransferTest, WithoutAHandleNothingIsSet) {
-  record_.givesNoHandle = true;
+  fRecord.givesNoHandle = true;
   TLines log;
-  WithStandIn(record_, [&] {
-    log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file_, true), kZEPStatusLibCurlFailure); });
+  WithStandIn(fRecord, [&] {
+    log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true), kZEPStatusLibCurlFailure); });
   });
   EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error initalizing curl"));
-  EXPECT_THAT(record_.calls, ElementsAre("global_init 3", "easy_init", "global_cleanup"));
+  EXPECT_THAT(fRecord.calls, ElementsAre("global_init 3", "easy_init", "global_cleanup"));
 }
 
 TEST_F(TransferTest, AFileThatCannotBeReadEndsAnUploadAfterTheCommonOptions) {
   TLines log;
-  WithStandIn(record_, [&] {
-    log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file_, false), kZEPStatusLibCurlFailure); });
+  WithStandIn(fRecord, [&] {
+    log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", fFile, false), kZEPStatusLibCurlFailure); });
   });
   EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error getting file size"));
-  EXPECT_THAT(record_.calls, ElementsAreArray(Joined(kStart, {}, kEnd)));
+  EXPECT_THAT(fRecord.calls, ElementsAreArray(Joined(kStart, {}, kEnd)));
 }
 
 TEST_F(TransferTest, AnUploadOfWhatCannotBeReadToItsEndIsAccessDenied) {
-  for (std::string const& file : {dir_.Path(), std::string("/proc/self/mem")}) {  // both open; the second one fails with EIO
+  for (std::string const& file : {fDir.Path(), std::string("/proc/self/mem")}) {  // both open; the second one fails with EIO
     SCOPED_TRACE(file);
     TCurlRecord record;
     TLines log;
@@ -189,11 +191,11 @@ TEST_F(TransferTest, AnUploadOfWhatCannotBeReadToItsEndIsAccessDenied) {
 }
 
 TEST_F(TransferTest, AFailedPerformSaysItsOwnReasonAlsoWhereTheFileCannotBeRead) {
-  record_.result = 67;
-  record_.errorText = "Access denied: 530";
+  fRecord.result = 67;
+  fRecord.errorText = "Access denied: 530";
   TLines log;
-  WithStandIn(record_, [&] {
-    log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", dir_.Path(), false), kZEPStatusAccessDenied); });
+  WithStandIn(fRecord, [&] {
+    log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", fDir.Path(), false), kZEPStatusAccessDenied); });
   });
   EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error performing command: Access denied: 530"));
 }
@@ -220,14 +222,14 @@ TEST_F(TransferTest, WhatPerformGivesBecomesAStatus) {
        "[Error] TOSSpecific|CurlTransferFile: Error performing command: Access denied: 530"},
       {99, "", kZEPStatusAccessDenied, "[Error] TOSSpecific|CurlTransferFile: Error performing command: "},
   };
-  WriteFile(dir_.Path("there"), "text");
+  WriteFile(fDir.Path("there"), "text");
   for (TRow const& row : rows)
     for (bool const download : {true, false}) {
       SCOPED_TRACE(std::to_string(row.result) + (download ? " down" : " up"));
       TCurlRecord record;
       record.result = row.result;
       record.errorText = row.errorText;
-      std::string const file = download ? file_ : dir_.Path("there");
+      std::string const file = download ? fFile : fDir.Path("there");
       TLines log;
       WithStandIn(record, [&] {
         log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file, download), row.status); });
@@ -238,10 +240,10 @@ TEST_F(TransferTest, WhatPerformGivesBecomesAStatus) {
 }
 
 TEST_F(TransferTest, APartOfABrokenDownloadStays) {
-  record_.chunks = {"part"};
-  record_.result = 18;
-  WithStandIn(record_, [&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file_, true), kZEPStatusAccessDenied); });
-  EXPECT_EQ(ReadFile(file_), "part");
+  fRecord.chunks = {"part"};
+  fRecord.result = 18;
+  WithStandIn(fRecord, [&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true), kZEPStatusAccessDenied); });
+  EXPECT_EQ(ReadFile(fFile), "part");
 }
 
 // ---- Loading libcurl ----
@@ -256,7 +258,7 @@ TEST_F(TransferTest, EachOfTheSixFunctionsIsNeeded) {
         record,
         [&] {
           transfer =
-              LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file_, true), kZEPStatusLibCurlFailure); });
+              LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true), kZEPStatusLibCurlFailure); });
           proxyCheck =
               LogOf([&] { EXPECT_STATUS(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), kZEPStatusLibCurlFailure); });
         },
@@ -272,26 +274,26 @@ TEST_F(TransferTest, EachOfTheSixFunctionsIsNeeded) {
 class LoadingCurlTest : public testing::Test {
 protected:
   LoadingCurlTest() {
-    fs::create_directory(dir_.Path("root"));
-    fs::create_directory(dir_.Path("system"));
+    fs::create_directory(fDir.Path("root"));
+    fs::create_directory(fDir.Path("system"));
     fs::copy(ZEP_LIBRARY, Root("libzepcore.so"));
     for (char const* name : {"libcurl.so", "libcurl.so.4"}) fs::copy(kStandIn, Root(name));
     for (char const* name : {"libcurl.so", "libcurl.so.4", "libcurl.so.3", "libcurl.so.2"}) fs::copy(kStandIn, System(name));
   }
 
-  std::string Root(std::string const& name) const { return dir_.Path("root/" + name); }
-  std::string System(std::string const& name) const { return dir_.Path("system/" + name); }
+  std::string Root(std::string const& name) const { return fDir.Path("root/" + name); }
+  std::string System(std::string const& name) const { return fDir.Path("system/" + name); }
 
   // A file in the loader's way: it finds that one, fails, and looks no further for the name.
   static void Spoil(std::string const& path) { WriteFile(path, ""); }
 
   TProgramRun Probe(std::string const& arguments = "") const {
-    return RunProgram("LD_LIBRARY_PATH=" + dir_.Path("root") + ":" + dir_.Path("system") + " " ZEP_CURL_DIR "/TransferProbe " +
+    return RunProgram("LD_LIBRARY_PATH=" + fDir.Path("root") + ":" + fDir.Path("system") + " " ZEP_CURL_DIR "/TransferProbe " +
                       arguments + " 2>&1");
   }
 
   std::string const kStandIn = TStandIn::Path("whole");
-  TTempDir dir_;
+  TTempDir fDir;
 };
 
 TEST_F(LoadingCurlTest, TheFirstThatLoadsIsUsedByEachCall) {
@@ -344,7 +346,7 @@ TEST_F(LoadingCurlTest, WithoutOneEachCallTriesEveryNameAgain) {
 // ---- The write callback ----
 
 TEST_F(TransferTest, WriteCallbackAppendsAndCloses) {
-  TCurlWriteContext context{file_, nullptr};
+  TCurlWriteContext context{fFile, nullptr};
   int const descriptors = OpenDescriptors();
   char first[] = "abcd", second[] = "efghij";
   EXPECT_EQ(curl_fwrite(first, 1, 4, &context), 4u);
@@ -352,13 +354,13 @@ TEST_F(TransferTest, WriteCallbackAppendsAndCloses) {
   EXPECT_EQ(curl_fwrite(second, 3, 2, &context), 2u) << "items, not bytes";
   EXPECT_EQ(curl_fwrite(second, 1, 0, &context), 0u);
   EXPECT_EQ(curl_fwrite(second, 0, 5, &context), 0u);
-  EXPECT_EQ(ReadFile(file_), "abcdefghij");
+  EXPECT_EQ(ReadFile(fFile), "abcdefghij");
   EXPECT_EQ(OpenDescriptors(), descriptors);
 }
 
 TEST_F(TransferTest, WriteCallbackRefusesWithoutContextPathOrFile) {
   char data[] = "abcd";
-  TCurlWriteContext noPath{"", nullptr}, noDirectory{dir_.Path("no/file"), nullptr}, directory{dir_.Path(), nullptr};
+  TCurlWriteContext noPath{"", nullptr}, noDirectory{fDir.Path("no/file"), nullptr}, directory{fDir.Path(), nullptr};
   EXPECT_EQ(curl_fwrite(data, 1, 4, nullptr), 0xFFFFFFFFu);
   EXPECT_EQ(curl_fwrite(data, 1, 4, &noPath), 0xFFFFFFFFu);
   EXPECT_EQ(curl_fwrite(data, 1, 4, &noDirectory), 0xFFFFFFFFu);
@@ -375,11 +377,11 @@ TEST_F(TransferTest, AChunkThatDoesNotGetToTheDiskIsNotWritten) {
 }
 
 TEST_F(TransferTest, ADownloadEndsAtTheFirstChunkThatIsRefused) {
-  record_.chunks = {"one", "two"};
-  WithStandIn(record_, [&] {
-    EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", dir_.Path("no/file"), true), kZEPStatusAccessDenied);
+  fRecord.chunks = {"one", "two"};
+  WithStandIn(fRecord, [&] {
+    EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", fDir.Path("no/file"), true), kZEPStatusAccessDenied);
   });
-  EXPECT_THAT(record_.calls, testing::Contains("write 4294967295").Times(1));
+  EXPECT_THAT(fRecord.calls, testing::Contains("write 4294967295").Times(1));
 }
 
 // ---- A local file in the way of a download ----
@@ -430,31 +432,31 @@ TEST_F(TransferTest, ALocalFileIsOverwrittenWhenTheAnswerIsY) {
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(testing::PrintToString(row.input));
-    WriteFile(file_, "old and longer");
-    std::string const output = DownloadOnto(file_, row.input, dir_);
+    WriteFile(fFile, "old and longer");
+    std::string const output = DownloadOnto(fFile, row.input, fDir);
     std::string const questions = Repeated(kQuestion, row.questions);
     if (row.isOverwritten) {
       EXPECT_THAT(output, StartsWith(questions + "\nglobal_init 3\n"));
       EXPECT_THAT(output, testing::HasSubstr("\nperform\n"));
-      EXPECT_EQ(ReadFile(file_), "new");
+      EXPECT_EQ(ReadFile(fFile), "new");
     } else {
       EXPECT_EQ(output, questions + kQuietEnd);
-      EXPECT_EQ(ReadFile(file_), "old and longer");
+      EXPECT_EQ(ReadFile(fFile), "old and longer");
     }
   }
 }
 
 TEST_F(TransferTest, ALocalFileThatCannotBeDeletedEndsQuietly) {
   // A directory opens for reading and is nothing that can be unlinked, not even by root.
-  fs::create_directory(file_);
-  EXPECT_EQ(DownloadOnto(file_, "y\n", dir_), kQuestion + "Permission denied.\n" + kQuietEnd);
-  EXPECT_TRUE(fs::is_directory(file_));
+  fs::create_directory(fFile);
+  EXPECT_EQ(DownloadOnto(fFile, "y\n", fDir), kQuestion + "Permission denied.\n" + kQuietEnd);
+  EXPECT_TRUE(fs::is_directory(fFile));
 }
 
 TEST_F(TransferTest, ALocalFileThatCannotBeReadIsNotAskedAbout) {
-  WriteFile(file_, "old");
-  fs::permissions(file_, fs::perms::owner_write | fs::perms::others_write);
-  fs::permissions(dir_.Path(), fs::perms::all);
+  WriteFile(fFile, "old");
+  fs::permissions(fFile, fs::perms::owner_write | fs::perms::others_write);
+  fs::permissions(fDir.Path(), fs::perms::all);
   NEEDS(InChild([] { return BecomeUnprivileged() ? "yes" : "no"; }) == "yes", "a user without privileges");
   std::string const text = InChild([&] {
     TCurlRecord record;
@@ -462,17 +464,17 @@ TEST_F(TransferTest, ALocalFileThatCannotBeReadIsNotAskedAbout) {
     TStandIn const standIn(record);
     if (!BecomeUnprivileged()) return std::string("still privileged");
     if (::freopen("/dev/null", "r", stdin) == nullptr) return std::string("no input");
-    TOSSpecific::CurlTransferFile("ftp://h/f", file_, true);
+    TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true);
     return std::string("no question");
   });
   EXPECT_EQ(text, "no question");
-  EXPECT_EQ(ReadFile(file_), "oldnew") << "the download is appended";
+  EXPECT_EQ(ReadFile(fFile), "oldnew") << "the download is appended";
 }
 
 // ---- The operations that make the URL ----
 
 TEST_F(TransferTest, UrlsAreMadeOfHostAndName) {
-  WriteFile(file_, "text");
+  WriteFile(fFile, "text");
   std::string const upload = "hostline/toqrv/vantor/fdr_upload/";
   struct TRow {
     char const* isBootable;
@@ -482,15 +484,15 @@ TEST_F(TransferTest, UrlsAreMadeOfHostAndName) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.isBootable ? row.isBootable : "not set");
     TEnvironmentGuard const guard("ZEP_ISBOOTABLE", row.isBootable);
-    std::string const absent = dir_.Path("absent");
+    std::string const absent = fDir.Path("absent");
     struct TOperation {
       std::function<void()> call;
       std::string url, uploaded;
     };
     TOperation const operations[] = {
-        {[&] { TOSSpecific::FTPFile("h:21", file_, "d/n"); }, "ftp://h:21/" + row.prefix + "d/n", "text"},
-        {[&] { TOSSpecific::sFTPFile("h", file_, "d/n"); }, "sftp://h/" + row.prefix + "d/n", "text"},
-        {[&] { TOSSpecific::UserFTPFile("h", file_, "n"); }, "ftp://h/n.xml.gz", "text"},
+        {[&] { TOSSpecific::FTPFile("h:21", fFile, "d/n"); }, "ftp://h:21/" + row.prefix + "d/n", "text"},
+        {[&] { TOSSpecific::sFTPFile("h", fFile, "d/n"); }, "sftp://h/" + row.prefix + "d/n", "text"},
+        {[&] { TOSSpecific::UserFTPFile("h", fFile, "n"); }, "ftp://h/n.xml.gz", "text"},
         {[&] { TOSSpecific::FTPFileFromQRV("h", absent, "d/n"); }, "ftp://h/d/n", ""},
         {[&] { TOSSpecific::sFTPFileFromQRV("u:p@h", absent, "n"); }, "sftp://u:p@h/n", ""},
     };
@@ -506,16 +508,16 @@ TEST_F(TransferTest, UrlsAreMadeOfHostAndName) {
 TEST_F(TransferTest, UserUploadNamesTheRemoteFileFirst) {
   TCurlRecord record;
   testing::internal::CaptureStdout();
-  WithStandIn(record, [&] { EXPECT_STATUS(TOSSpecific::UserFTPFile("h", file_, "nightly"), kZEPStatusLibCurlFailure); });
+  WithStandIn(record, [&] { EXPECT_STATUS(TOSSpecific::UserFTPFile("h", fFile, "nightly"), kZEPStatusLibCurlFailure); });
   EXPECT_EQ(testing::internal::GetCapturedStdout(), "Remote file name = nightly.xml.gz\n");
 }
 
 TEST_F(TransferTest, WhatATransferThrowsPassesThrough) {
-  WriteFile(file_, "text");
+  WriteFile(fFile, "text");
   for (auto const& operation : std::vector<std::function<void()>>{
-           [&] { TOSSpecific::FTPFile("h", file_, "n"); }, [&] { TOSSpecific::sFTPFile("h", file_, "n"); },
-           [&] { TOSSpecific::FTPFileFromQRV("h", dir_.Path("a"), "n"); },
-           [&] { TOSSpecific::sFTPFileFromQRV("h", dir_.Path("a"), "n"); }, [&] { TOSSpecific::UserFTPFile("h", file_, "n"); }}) {
+           [&] { TOSSpecific::FTPFile("h", fFile, "n"); }, [&] { TOSSpecific::sFTPFile("h", fFile, "n"); },
+           [&] { TOSSpecific::FTPFileFromQRV("h", fDir.Path("a"), "n"); },
+           [&] { TOSSpecific::sFTPFileFromQRV("h", fDir.Path("a"), "n"); }, [&] { TOSSpecific::UserFTPFile("h", fFile, "n"); }}) {
     TCurlRecord record;
     record.result = 7;
     WithStandIn(record, [&] { EXPECT_STATUS(operation(), kZEPStatusConnectionFailed); });
@@ -526,29 +528,29 @@ TEST_F(TransferTest, WhatATransferThrowsPassesThrough) {
 
 class ProxyCheckTest : public TransferTest {
 protected:
-  TWorkingDirectory const work_{dir_.Path()};
+  TWorkingDirectory const fWork{fDir.Path()};
 };
 
 TEST_F(ProxyCheckTest, SetsItsOptionsInOrder) {
-  record_.chunks = {"<html>", "</html>"};
-  record_.fileToWatch = dir_.Path("content.html");
+  fRecord.chunks = {"<html>", "</html>"};
+  fRecord.fileToWatch = fDir.Path("content.html");
   TLines log;
-  WithStandIn(record_, [&] {
+  WithStandIn(fRecord, [&] {
     log = LogOf([&] { EXPECT_EQ(TOSSpecific::CheckProxySetting("10.0.0.1", "8080", "u:p", 5), kZEPStatusOK); });
   });
-  EXPECT_THAT(record_.calls, ElementsAre("global_init 3", "easy_init", "setopt ERRORBUFFER buffer", "setopt PROXY '10.0.0.1'",
+  EXPECT_THAT(fRecord.calls, ElementsAre("global_init 3", "easy_init", "setopt ERRORBUFFER buffer", "setopt PROXY '10.0.0.1'",
                                          "setopt PROXYPORT 8080", "setopt URL '" ZEP_PROXY_CHECK_PAGE "'",
                                          "setopt WRITEFUNCTION function", "setopt WRITEDATA context", "setopt PROXYUSERPWD 'u:p'",
                                          "perform", "write 6 file 6", "write 7 file 13", "easy_cleanup", "global_cleanup"));
-  EXPECT_EQ(ReadFile(dir_.Path("content.html")), "<html></html>");
+  EXPECT_EQ(ReadFile(fDir.Path("content.html")), "<html></html>");
   EXPECT_THAT(log, IsEmpty());
 }
 
 TEST_F(ProxyCheckTest, ThePageIsAddedToAFileThatIsThere) {
-  WriteFile(dir_.Path("content.html"), "earlier ");
-  record_.chunks = {"page"};
-  WithStandIn(record_, [] { EXPECT_EQ(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), kZEPStatusOK); });
-  EXPECT_EQ(ReadFile(dir_.Path("content.html")), "earlier page");
+  WriteFile(fDir.Path("content.html"), "earlier ");
+  fRecord.chunks = {"page"};
+  WithStandIn(fRecord, [] { EXPECT_EQ(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), kZEPStatusOK); });
+  EXPECT_EQ(ReadFile(fDir.Path("content.html")), "earlier page");
 }
 
 TEST_F(ProxyCheckTest, ARefusedOptionEndsIt) {
@@ -563,9 +565,9 @@ TEST_F(ProxyCheckTest, ARefusedOptionEndsIt) {
 }
 
 TEST_F(ProxyCheckTest, WithoutAHandleNothingIsSet) {
-  record_.givesNoHandle = true;
+  fRecord.givesNoHandle = true;
   TLines log;
-  WithStandIn(record_, [&] {
+  WithStandIn(fRecord, [&] {
     log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), kZEPStatusLibCurlFailure); });
   });
   EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CheckProxySetting: Error initalizing curl"));
@@ -590,8 +592,8 @@ TEST_F(ProxyCheckTest, AFailedPerformIsLoggedAndReturned) {
 }
 
 TEST_F(ProxyCheckTest, APortThatIsNoNumberIsNone) {
-  WithStandIn(record_, [] { TOSSpecific::CheckProxySetting("p", "many", "", 0); });
-  EXPECT_THAT(record_.calls, testing::IsSupersetOf({"setopt PROXYPORT 0", "setopt PROXYUSERPWD ''"}));
+  WithStandIn(fRecord, [] { TOSSpecific::CheckProxySetting("p", "many", "", 0); });
+  EXPECT_THAT(fRecord.calls, testing::IsSupersetOf({"setopt PROXYPORT 0", "setopt PROXYUSERPWD ''"}));
 }
 
 // ---- The host name ----

@@ -1,4 +1,6 @@
 #!/usr/bin/env bash
+# SPDX-License-Identifier: Apache-2.0
+#
 # Installs the build tree given into a fresh prefix and reads from every program and library there how it was hardened.
 #
 #   hardening-test.sh BUILD_DIR

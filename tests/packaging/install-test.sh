@@ -1,4 +1,6 @@
 #!/usr/bin/env bash
+# SPDX-License-Identifier: Apache-2.0
+#
 # Installs the build tree given into a fresh prefix and uses it there as a stranger would: runs zep, and builds the consumer
 # with CMake and with pkg-config, and a provider plug-in with CMake.
 #

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Tests each step of the discovery separately. A step that uses a network runs on a thread in an empty network namespace.
 // The steps that end processes, wpadPreconfig and StartWpad, are tested in tests/system/wpad only.
 

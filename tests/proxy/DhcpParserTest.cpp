@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Parsing the options of a DHCP reply, which anyone can send to the port.
 
 #include "tests/proxy/Replies.h"
@@ -12,11 +14,11 @@ constexpr std::size_t kSize = AutoProxyDiscovery::kOptionsSize;
 class DhcpParserTest : public testing::Test {
 protected:
   std::string Parse(TBytes const& options) {
-    area_.Hold(options);
-    return AutoProxyDiscovery::dhcp_parser(area_.Data());
+    fArea.Hold(options);
+    return AutoProxyDiscovery::dhcp_parser(fArea.Data());
   }
 
-  TOptionsArea area_;
+  TOptionsArea fArea;
 };
 
 // As few options as possible, each of code 1, that fill the area up to that offset.

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep: the reference front end. One program with subcommands, each in a file of its own.
 
 #include "tools/zep/commands/Commands.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Includes no other header of the library: a caller that locks the mutex needs only this one.
 
 #include "TCIMCopy.h"

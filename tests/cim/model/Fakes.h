@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // A small object model for the tests of this room. It records its calls and fails on demand. An operation that no test needs

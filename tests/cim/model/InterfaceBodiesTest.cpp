@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // What a plug-in may leave out of an implementation of the interfaces.
 
 #include "Fakes.h"
@@ -42,10 +44,10 @@ public:
 };
 
 TEST(InterfaceBodiesTest, WhatNeedsAnAnswerIsNotImplemented) {
-  const TCIMContext none;
-  const auto ns = boost::make_shared<TFakeNamespace>();
-  const TFakeInstance instance;
-  const TFakePropertyDecl property("Id", ECIMType::kCIMTypeUint32, TCIMValue(1u));
+  TCIMContext const none;
+  auto const ns = boost::make_shared<TFakeNamespace>();
+  TFakeInstance const instance;
+  TFakePropertyDecl const property("Id", ECIMType::kCIMTypeUint32, TCIMValue(1u));
   EXPECT_STATUS(ns->GetName(none), kZEPStatusNotImplemented);
   EXPECT_STATUS(ns->CreateQualifierDecl("Key", TCIMValue(false), 0, 0, none), kZEPStatusNotImplemented);
   ICIMClass& cls = ns->Add("X_Disk");
@@ -60,13 +62,13 @@ TEST(InterfaceBodiesTest, WhatNeedsAnAnswerIsNotImplemented) {
 }
 
 TEST(InterfaceBodiesTest, AClassIsNotAbstract) {
-  const auto ns = boost::make_shared<TFakeNamespace>();
+  auto const ns = boost::make_shared<TFakeNamespace>();
   ICIMClass const& cls = ns->Add("X_Disk");
   EXPECT_FALSE(cls.IsAbstract(TCIMContext()));
 }
 
 TEST(InterfaceBodiesTest, BackPointersAreEmpty) {
-  const TCIMContext none;
+  TCIMContext const none;
   EXPECT_FALSE(TFakePropertyDecl("Id", ECIMType::kCIMTypeUint32, TCIMValue(1u)).GetOwner(none).lock());
   EXPECT_FALSE(TBareMethodDecl().GetOwner(none).lock());
   EXPECT_FALSE(TBareParameterDecl().GetMethod(none).lock());
@@ -74,8 +76,8 @@ TEST(InterfaceBodiesTest, BackPointersAreEmpty) {
 }
 
 TEST(InterfaceBodiesTest, BeginAndEndOfDeclarationsDoNothing) {
-  const TCIMContext none;
-  const auto ns = boost::make_shared<TFakeNamespace>();
+  TCIMContext const none;
+  auto const ns = boost::make_shared<TFakeNamespace>();
   ICIMClass& cls = ns->Add("X_Disk");
   EXPECT_NO_THROW(cls.BeginDeclarations(none));
   EXPECT_STATUS(cls.GetPropertyDecl("Id", none), kZEPStatusNotFound);

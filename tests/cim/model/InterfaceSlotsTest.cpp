@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The order of the virtual operations through which plug-ins and the library call each other. Other operations may come
 // between them.
 

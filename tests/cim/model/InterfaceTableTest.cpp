@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The table of docs/writing-a-provider.md that says which operations each use needs: a model that has just those is enough,
 // each of them is called, and one that is left out is named in the log.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TCIMCopy.h"
 
 #include "TracedModel.h"
@@ -20,32 +21,32 @@ constexpr char kLine[] = "[Debug] TCopyPropertyDecl::operator() - Get an Excepti
 // Namespaces that are written to may refer to traced classes, which a trace outlives.
 class TCIMCopyTest : public testing::Test {
 protected:
-  TCIMCopyTest() : source_(NewNamespace()), copy_(boost::make_shared<TMemoryNamespace>("root/copy")) {
-    source_->DeclareStandardQualifiers();
+  TCIMCopyTest() : fSource(NewNamespace()), fCopy(boost::make_shared<TMemoryNamespace>("root/copy")) {
+    fSource->DeclareStandardQualifiers();
   }
 
-  void CopyAll(bool noProductInstances = false) { TCIMCopy::CopyClasses(source_, copy_, noProductInstances); }
+  void CopyAll(bool noProductInstances = false) { TCIMCopy::CopyClasses(fSource, fCopy, noProductInstances); }
   void CopyTraced(bool noProductInstances = false) {
-    TCIMCopy::CopyClasses(Traced(source_, "src"), Traced(copy_, "dst"), noProductInstances);
+    TCIMCopy::CopyClasses(Traced(fSource, "src"), Traced(fCopy, "dst"), noProductInstances);
   }
   boost::shared_ptr<ICIMNamespace> Traced(boost::shared_ptr<ICIMNamespace> ns, std::string const& label) {
-    return boost::make_shared<TTracedNamespace>(trace_, ns, label);
+    return boost::make_shared<TTracedNamespace>(fTrace, ns, label);
   }
 
   // The calls that begin with one of the words, in order.
   std::vector<std::string> Calls(std::vector<std::string> const& words) const {
     std::vector<std::string> calls;
-    for (std::string const& call : trace_.fCalls)
+    for (std::string const& call : fTrace.fCalls)
       for (std::string const& word : words)
         if (call.rfind(word, 0) == 0) calls.push_back(call);
     return calls;
   }
   void FailOn(std::string const& call, EZEPStatusCode status = kZEPStatusFail) {
-    trace_.fOnCall[call] = [status] { throw TZEPException(status); };
+    fTrace.fOnCall[call] = [status] { throw TZEPException(status); };
   }
 
-  TTrace trace_;
-  boost::shared_ptr<TMemoryNamespace> source_, copy_;
+  TTrace fTrace;
+  boost::shared_ptr<TMemoryNamespace> fSource, fCopy;
 };
 
 boost::shared_ptr<ICIMPropertyDecl> Decl(ICIMNamespace const& ns, std::string const& cls, std::string const& name) {
@@ -57,8 +58,8 @@ boost::shared_ptr<ICIMPropertyDecl> Decl(ICIMNamespace const& ns, std::string co
 // ---- CopyClasses ----
 
 TEST_F(TCIMCopyTest, QualifierDeclarationsComeFirstThenTheTwoPasses) {
-  source_->DefineClass("X_Link").Association();
-  source_->DefineClass("X_Disk");
+  fSource->DefineClass("X_Link").Association();
+  fSource->DefineClass("X_Disk");
   CopyTraced();
   EXPECT_THAT(
       Calls({"EnumerateQualifierDecls", "EnumerateClasses", "CreateClass", "EnumerateSubClasses", "GetClassFlag"}),
@@ -66,25 +67,25 @@ TEST_F(TCIMCopyTest, QualifierDeclarationsComeFirstThenTheTwoPasses) {
                   "EnumerateSubClasses src:X_Link", "GetClassFlag src:X_Disk", "CreateClass dst:X_Disk",
                   "EnumerateSubClasses src:X_Disk", "EnumerateClasses src:", "GetClassFlag src:X_Link", "CreateClass dst:X_Link",
                   "EnumerateSubClasses src:X_Link", "GetClassFlag src:X_Disk", "EnumerateSubClasses src:X_Disk"));
-  EXPECT_EQ(trace_.fCalls[1], "CreateQualifierDecl dst:Abstract");
-  EXPECT_EQ(trace_.fContextEntries, 0u);
+  EXPECT_EQ(fTrace.fCalls[1], "CreateQualifierDecl dst:Abstract");
+  EXPECT_EQ(fTrace.fContextEntries, 0u);
 }
 
 TEST_F(TCIMCopyTest, AQualifierDeclarationIsCopiedWithAllFiveAttributes) {
-  const auto source = NewNamespace();
+  auto const source = NewNamespace();
   source->CreateQualifierDecl("X_Words", TCIMValue(TType::kCIMTypeString, 3, {TCIMValue("a"), TCIMValue("b")}),
                               ICIMQualifierDecl::kScopeMethod, ICIMQualifierDecl::kFlavorTranslatable, kNone);
   source->CreateQualifierDecl("X_Max", NullOf("sint64"), ICIMQualifierDecl::kScopeAny, 0, kNone);
-  TCIMCopy::CopyClasses(source, copy_, false);
+  TCIMCopy::CopyClasses(source, fCopy, false);
 
-  EXPECT_THAT(Names(*copy_, &ICIMNamespace::EnumerateQualifierDecls), ElementsAre("X_Words", "X_Max"));
-  const auto words = copy_->GetQualifierDecl("X_Words", kNone);
+  EXPECT_THAT(Names(*fCopy, &ICIMNamespace::EnumerateQualifierDecls), ElementsAre("X_Words", "X_Max"));
+  auto const words = fCopy->GetQualifierDecl("X_Words", kNone);
   EXPECT_EQ(words->GetType(kNone), TType(TType::ECIMType(TType::kCIMTypeString | TType::kCIMTypeArrayFlag)));
   EXPECT_EQ(words->GetDefaultValue(kNone).ToString(), "{ a, b }");
   EXPECT_EQ(words->GetDefaultValue(kNone).GetMaxArraySize(), 3u);
   EXPECT_EQ(words->GetScope(kNone), ICIMQualifierDecl::kScopeMethod);
   EXPECT_EQ(words->GetFlavor(kNone), ICIMQualifierDecl::kFlavorTranslatable);
-  const auto max = copy_->GetQualifierDecl("X_Max", kNone);
+  auto const max = fCopy->GetQualifierDecl("X_Max", kNone);
   EXPECT_EQ(max->GetType(kNone), TType::kCIMTypeSint64);
   EXPECT_TRUE(max->GetDefaultValue(kNone).IsNull());
   EXPECT_EQ(max->GetScope(kNone), ICIMQualifierDecl::kScopeAny);
@@ -92,41 +93,41 @@ TEST_F(TCIMCopyTest, AQualifierDeclarationIsCopiedWithAllFiveAttributes) {
 }
 
 TEST_F(TCIMCopyTest, EachClassOfATreeIsMadeOnceUnderItsSuperclass) {
-  source_->DefineClass("X_A");
-  source_->DefineClass("X_B", "X_A");
-  source_->DefineClass("X_Link").Association();
-  source_->DefineClass("X_C", "X_B");
-  source_->DefineClass("X_FastLink", "X_Link");
-  source_->DefineClass("X_D", "X_A");
+  fSource->DefineClass("X_A");
+  fSource->DefineClass("X_B", "X_A");
+  fSource->DefineClass("X_Link").Association();
+  fSource->DefineClass("X_C", "X_B");
+  fSource->DefineClass("X_FastLink", "X_Link");
+  fSource->DefineClass("X_D", "X_A");
   CopyTraced();
   EXPECT_THAT(Calls({"CreateClass"}),
               ElementsAre("CreateClass dst:X_A", "CreateClass dst:X_B under X_A", "CreateClass dst:X_C under X_B",
                           "CreateClass dst:X_D under X_A", "CreateClass dst:X_Link", "CreateClass dst:X_FastLink under X_Link"));
-  EXPECT_THAT(ClassNames(*copy_), ElementsAre("X_A", "X_Link"));
-  EXPECT_THAT(SubClassNames(*copy_->GetClass("X_A", kNone)), ElementsAre("X_B", "X_C", "X_D"));
+  EXPECT_THAT(ClassNames(*fCopy), ElementsAre("X_A", "X_Link"));
+  EXPECT_THAT(SubClassNames(*fCopy->GetClass("X_A", kNone)), ElementsAre("X_B", "X_C", "X_D"));
 }
 
 TEST_F(TCIMCopyTest, AQualifierThatTheDestinationDeclaresAlreadyEndsTheCopy) {
-  source_->DefineClass("X_A");
-  copy_->CreateQualifierDecl("Aggregate", TCIMValue(false), ICIMQualifierDecl::kScopeAny, 0, kNone);
+  fSource->DefineClass("X_A");
+  fCopy->CreateQualifierDecl("Aggregate", TCIMValue(false), ICIMQualifierDecl::kScopeAny, 0, kNone);
   EXPECT_STATUS(CopyAll(), kZEPStatusAlreadyExists);
-  EXPECT_THAT(Names(*copy_, &ICIMNamespace::EnumerateQualifierDecls), ElementsAre("Aggregate", "Abstract"));
-  EXPECT_THAT(ClassNames(*copy_), IsEmpty());
+  EXPECT_THAT(Names(*fCopy, &ICIMNamespace::EnumerateQualifierDecls), ElementsAre("Aggregate", "Abstract"));
+  EXPECT_THAT(ClassNames(*fCopy), IsEmpty());
 }
 
 TEST_F(TCIMCopyTest, AFailureEndsTheCopyAndLeavesWhatWasMade) {
-  source_->DefineClass("X_A").Property("Name", "string");
-  source_->DefineClass("X_B")
+  fSource->DefineClass("X_A").Property("Name", "string");
+  fSource->DefineClass("X_B")
       .Property("Name", "string")
       .Method("Reset", "uint32")
       .In("Force", "boolean")
       .Method("Stop", "uint32");
-  source_->DefineClass("X_C");
+  fSource->DefineClass("X_C");
   FailOn("AddParameterDecl dst:X_B.Reset.Force", kZEPStatusOutOfMemory);
   EXPECT_STATUS(CopyTraced(), kZEPStatusOutOfMemory);
-  EXPECT_THAT(ClassNames(*copy_), ElementsAre("X_A", "X_B"));
-  EXPECT_THAT(Names(*copy_->GetClass("X_B", kNone), &ICIMClass::EnumeratePropertyDecls), ElementsAre("Name"));
-  EXPECT_THAT(Names(*copy_->GetClass("X_B", kNone), &ICIMClass::EnumerateMethodDecls), ElementsAre("Reset"));
+  EXPECT_THAT(ClassNames(*fCopy), ElementsAre("X_A", "X_B"));
+  EXPECT_THAT(Names(*fCopy->GetClass("X_B", kNone), &ICIMClass::EnumeratePropertyDecls), ElementsAre("Name"));
+  EXPECT_THAT(Names(*fCopy->GetClass("X_B", kNone), &ICIMClass::EnumerateMethodDecls), ElementsAre("Reset"));
 }
 
 TEST_F(TCIMCopyTest, NothingButTheDeclarationsOfPropertiesSwallowsAnException) {
@@ -140,7 +141,7 @@ TEST_F(TCIMCopyTest, NothingButTheDeclarationsOfPropertiesSwallowsAnException) {
     SCOPED_TRACE(call);
     TTrace trace;
     trace.fOnCall[call] = [] { throw TZEPException(kZEPStatusCorruptedContainer); };
-    const auto source = NewNamespace();
+    auto const source = NewNamespace();
     source->DefineClass("X_A");
     source->DefineClass("X_B", "X_A")
         .Description("b")
@@ -148,7 +149,7 @@ TEST_F(TCIMCopyTest, NothingButTheDeclarationsOfPropertiesSwallowsAnException) {
         .Method("Reset", "uint32")
         .Description("r")
         .In("Force", "boolean");
-    const auto copy = NewNamespace();
+    auto const copy = NewNamespace();
     EXPECT_STATUS(TCIMCopy::CopyClasses(boost::make_shared<TTracedNamespace>(trace, source, "src"),
                                         boost::make_shared<TTracedNamespace>(trace, copy, "dst"), false),
                   kZEPStatusCorruptedContainer);
@@ -156,16 +157,16 @@ TEST_F(TCIMCopyTest, NothingButTheDeclarationsOfPropertiesSwallowsAnException) {
 }
 
 TEST_F(TCIMCopyTest, AnEmptyNamespaceIsAFailedAssertion) {
-  const boost::shared_ptr<ICIMNamespace> none;
-  EXPECT_STATUS(TCIMCopy::CopyClasses(none, copy_, false), kZEPStatusFail);
-  EXPECT_STATUS(TCIMCopy::CopyClasses(source_, none, false), kZEPStatusFail);
+  boost::shared_ptr<ICIMNamespace> const none;
+  EXPECT_STATUS(TCIMCopy::CopyClasses(none, fCopy, false), kZEPStatusFail);
+  EXPECT_STATUS(TCIMCopy::CopyClasses(fSource, none, false), kZEPStatusFail);
 }
 
 // ---- CopyClass ----
 
 TEST_F(TCIMCopyTest, AClassIsCopiedInTheOrderOfItsParts) {
-  source_->DefineClass("X_A");
-  source_->DefineClass("X_B", "X_A")
+  fSource->DefineClass("X_A");
+  fSource->DefineClass("X_B", "X_A")
       .Description("b")
       .Property("Name", "string", "x")
       .Override()
@@ -174,11 +175,11 @@ TEST_F(TCIMCopyTest, AClassIsCopiedInTheOrderOfItsParts) {
       .Description("r")
       .In("Force", "boolean");
   CopyAll();
-  const auto copy = NewNamespace();
+  auto const copy = NewNamespace();
   copy->DefineClass("X_A");
-  TCIMCopy::CopyClass(Traced(source_, "src")->GetClass("X_B", kNone), Traced(copy, "dst"));
+  TCIMCopy::CopyClass(Traced(fSource, "src")->GetClass("X_B", kNone), Traced(copy, "dst"));
   EXPECT_THAT(
-      trace_.fCalls,
+      fTrace.fCalls,
       ElementsAre("GetClass src:X_B", "GetClass dst:X_A", "CreateClass dst:X_B under X_A", "EnumerateQualifiers src:X_B",
                   "GetQualifierDecl dst:Description", "AddQualifier dst:X_B Description",
 
@@ -198,31 +199,31 @@ TEST_F(TCIMCopyTest, AClassIsCopiedInTheOrderOfItsParts) {
 }
 
 TEST_F(TCIMCopyTest, ASuperclassThatIsMissingEndsTheCopyOfAClass) {
-  source_->DefineClass("X_A");
-  source_->DefineClass("X_B", "X_A");
-  EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_B", kNone), copy_), kZEPStatusNotFound);
-  EXPECT_THAT(ClassNames(*copy_), IsEmpty());
+  fSource->DefineClass("X_A");
+  fSource->DefineClass("X_B", "X_A");
+  EXPECT_STATUS(TCIMCopy::CopyClass(fSource->GetClass("X_B", kNone), fCopy), kZEPStatusNotFound);
+  EXPECT_THAT(ClassNames(*fCopy), IsEmpty());
 }
 
 TEST_F(TCIMCopyTest, AnEmptyAnswerForAClassCountsAsNotFound) {
-  source_->DefineClass("X_A").Key("Id", "uint32");
-  source_->DefineClass("X_B", "X_A");
-  const auto instance = source_->AddInstance("X_A", {{"Id", 1}});
+  fSource->DefineClass("X_A").Key("Id", "uint32");
+  fSource->DefineClass("X_B", "X_A");
+  auto const instance = fSource->AddInstance("X_A", {{"Id", 1}});
   TCIMValue nullReference = NullOf("reference");
-  nullReference.SetReferencedClass(source_->GetClass("X_A", kNone));
-  trace_.fAnswersUnknownClassByEmpty = true;
-  const auto destination = Traced(copy_, "dst");
-  EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_B", kNone), destination), kZEPStatusNotFound);
+  nullReference.SetReferencedClass(fSource->GetClass("X_A", kNone));
+  fTrace.fAnswersUnknownClassByEmpty = true;
+  auto const destination = Traced(fCopy, "dst");
+  EXPECT_STATUS(TCIMCopy::CopyClass(fSource->GetClass("X_B", kNone), destination), kZEPStatusNotFound);
   EXPECT_STATUS(TCIMCopy::CopyInstance(instance, destination), kZEPStatusNotFound);
   EXPECT_STATUS(TCIMCopy::CopyValue(nullReference, destination), kZEPStatusNotFound);
   EXPECT_STATUS(TCIMCopy::CopyValue(instance->GetReference(), destination), kZEPStatusNotFound);
-  EXPECT_THAT(trace_.fCalls, ElementsAre("GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A"));
-  EXPECT_THAT(ClassNames(*copy_), IsEmpty());
+  EXPECT_THAT(fTrace.fCalls, ElementsAre("GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A", "GetClass dst:X_A"));
+  EXPECT_THAT(ClassNames(*fCopy), IsEmpty());
 }
 
 // A class X_B with one of everything that can be made in a destination, below X_A, and the product class with an instance.
 boost::shared_ptr<TMemoryNamespace> SourceOfEverything() {
-  const auto source = NewNamespace();
+  auto const source = NewNamespace();
   source->DefineClass("X_A");
   source->DefineClass("X_B", "X_A")
       .Description("b")
@@ -247,7 +248,7 @@ TEST_F(TCIMCopyTest, AnyEmptyAnswerOfTheDestinationIsNotFoundBeforeAnythingElseI
     SCOPED_TRACE(call);
     TTrace trace;
     trace.fEmptyAnswer = call;
-    const auto copy = NewNamespace();
+    auto const copy = NewNamespace();
     EXPECT_STATUS(TCIMCopy::CopyClasses(boost::make_shared<TTracedNamespace>(trace, SourceOfEverything(), "src"),
                                         boost::make_shared<TTracedNamespace>(trace, copy, "dst"), false),
                   kZEPStatusNotFound);
@@ -260,75 +261,75 @@ TEST_F(TCIMCopyTest, AnEmptyAnswerWhileAPropertyIsDeclaredLeavesOneLineAndTheOth
     SCOPED_TRACE(call);
     TTrace trace;
     trace.fEmptyAnswer = call;
-    const auto copy = NewNamespace();
+    auto const copy = NewNamespace();
     OnNewThread([&] {
-      const TLogCapture log;
+      TLogCapture const log;
       TCIMCopy::CopyClasses(SourceOfEverything(), boost::make_shared<TTracedNamespace>(trace, copy, "dst"), false);
       EXPECT_THAT(log.Entries(), ElementsAre(kLine));
     });
     EXPECT_TRUE(Decl(*copy, "X_B", "Size"));
-    const auto next = std::find(trace.fCalls.begin(), trace.fCalls.end(), call) + 1;
+    auto const next = std::find(trace.fCalls.begin(), trace.fCalls.end(), call) + 1;
     EXPECT_EQ(*next, "GetPropertyDecl dst:X_B.Size");
   }
 }
 
 TEST_F(TCIMCopyTest, ARootClassLooksUpNoSuperclass) {
-  source_->DefineClass("X_A");
-  TCIMCopy::CopyClass(source_->GetClass("X_A", kNone), Traced(copy_, "dst"));
+  fSource->DefineClass("X_A");
+  TCIMCopy::CopyClass(fSource->GetClass("X_A", kNone), Traced(fCopy, "dst"));
   EXPECT_THAT(Calls({"GetClass", "CreateClass"}), ElementsAre("CreateClass dst:X_A"));
 }
 
 TEST_F(TCIMCopyTest, AClassThatIsThereAlreadyEndsTheCopyOfAClass) {
-  source_->DefineClass("X_A");
-  copy_->DefineClass("X_A");
-  EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_A", kNone), copy_), kZEPStatusAlreadyExists);
+  fSource->DefineClass("X_A");
+  fCopy->DefineClass("X_A");
+  EXPECT_STATUS(TCIMCopy::CopyClass(fSource->GetClass("X_A", kNone), fCopy), kZEPStatusAlreadyExists);
 }
 
 TEST_F(TCIMCopyTest, AQualifierThatTheDestinationDoesNotDeclareEndsTheCopyOfAClass) {
-  source_->DefineClass("X_A").Description("a").Property("Name", "string");
-  EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_A", kNone), copy_), kZEPStatusNotFound);
-  EXPECT_THAT(ClassNames(*copy_), ElementsAre("X_A"));
-  EXPECT_THAT(Names(*copy_->GetClass("X_A", kNone), &ICIMClass::EnumeratePropertyDecls), IsEmpty());
+  fSource->DefineClass("X_A").Description("a").Property("Name", "string");
+  EXPECT_STATUS(TCIMCopy::CopyClass(fSource->GetClass("X_A", kNone), fCopy), kZEPStatusNotFound);
+  EXPECT_THAT(ClassNames(*fCopy), ElementsAre("X_A"));
+  EXPECT_THAT(Names(*fCopy->GetClass("X_A", kNone), &ICIMClass::EnumeratePropertyDecls), IsEmpty());
 }
 
 TEST_F(TCIMCopyTest, AnUndeclaredQualifierIsNotAskedFor) {
-  source_->DefineClass("X_A").Description("a");
-  EXPECT_STATUS(TCIMCopy::CopyClass(source_->GetClass("X_A", kNone), Traced(copy_, "dst")), kZEPStatusNotFound);
-  EXPECT_THAT(trace_.fCalls, ElementsAre("CreateClass dst:X_A", "GetQualifierDecl dst:Description"));
+  fSource->DefineClass("X_A").Description("a");
+  EXPECT_STATUS(TCIMCopy::CopyClass(fSource->GetClass("X_A", kNone), Traced(fCopy, "dst")), kZEPStatusNotFound);
+  EXPECT_THAT(fTrace.fCalls, ElementsAre("CreateClass dst:X_A", "GetQualifierDecl dst:Description"));
 }
 
 TEST_F(TCIMCopyTest, AnUndeclaredQualifierOfAPropertyLeavesTheDeclarationWithoutItAndOneLine) {
-  source_->DefineClass("X_A").Property("Name", "string").Description("n").Property("Size", "uint64");
+  fSource->DefineClass("X_A").Property("Name", "string").Description("n").Property("Size", "uint64");
   OnNewThread([&] {
-    const TLogCapture log;
-    TCIMCopy::CopyClass(source_->GetClass("X_A", kNone), copy_);
+    TLogCapture const log;
+    TCIMCopy::CopyClass(fSource->GetClass("X_A", kNone), fCopy);
     EXPECT_THAT(log.Entries(), ElementsAre(kLine));
   });
-  EXPECT_THAT(Names(*copy_->GetClass("X_A", kNone), &ICIMClass::EnumeratePropertyDecls), ElementsAre("Name", "Size"));
-  EXPECT_FALSE(Decl(*copy_, "X_A", "Name")->GetQualifier("Description", kNone));
+  EXPECT_THAT(Names(*fCopy->GetClass("X_A", kNone), &ICIMClass::EnumeratePropertyDecls), ElementsAre("Name", "Size"));
+  EXPECT_FALSE(Decl(*fCopy, "X_A", "Name")->GetQualifier("Description", kNone));
 }
 
 TEST_F(TCIMCopyTest, ACopiedQualifierHasItsValueAndItsOwnFlavor) {
-  const auto cls = source_->DefineClass("X_A").Class();
-  cls->AddQualifier(source_->GetQualifierDecl("Description", kNone), TCIMValue("a"), ICIMQualifierDecl::kFlavorToSubclass, kNone);
-  cls->AddQualifier(source_->GetQualifierDecl("Abstract", kNone), TCIMValue(false), 0, kNone);
+  auto const cls = fSource->DefineClass("X_A").Class();
+  cls->AddQualifier(fSource->GetQualifierDecl("Description", kNone), TCIMValue("a"), ICIMQualifierDecl::kFlavorToSubclass, kNone);
+  cls->AddQualifier(fSource->GetQualifierDecl("Abstract", kNone), TCIMValue(false), 0, kNone);
   CopyAll();
-  const auto copy = copy_->GetClass("X_A", kNone);
+  auto const copy = fCopy->GetClass("X_A", kNone);
   EXPECT_THAT(Names(*copy, &ICIMNamedElement::EnumerateQualifiers), ElementsAre("Description", "Abstract"));
   EXPECT_EQ(copy->GetQualifier("Description", kNone)->GetValue(kNone).ToString(), "a");
   EXPECT_EQ(copy->GetQualifier("Description", kNone)->GetFlavor(kNone), ICIMQualifierDecl::kFlavorToSubclass);
-  EXPECT_EQ(copy->GetQualifier("Description", kNone)->GetDeclaration(kNone), copy_->GetQualifierDecl("Description", kNone));
+  EXPECT_EQ(copy->GetQualifier("Description", kNone)->GetDeclaration(kNone), fCopy->GetQualifierDecl("Description", kNone));
   EXPECT_FALSE(copy->IsAbstract(kNone));
 }
 
 TEST_F(TCIMCopyTest, AMethodIsCopiedWithItsParametersAndTheirQualifiers) {
-  auto const cls = source_->DefineClass("X_A").Method("Find", "sint32").Description("f").Out("Names", "string[8]").Class();
+  auto const cls = fSource->DefineClass("X_A").Method("Find", "sint32").Description("f").Out("Names", "string[8]").Class();
   auto const method = All(*cls, &ICIMClass::EnumerateMethodDecls).front();
   method->AddParameterDecl("Disk", TType::kCIMTypeReference, 0, "X_A", kNone);
   method->AddParameterDecl("Disks", TType::ECIMType(TType::kCIMTypeReference | TType::kCIMTypeArrayFlag), 2, "X_Unknown", kNone);
   CopyAll();
 
-  auto const copy = All(*copy_->GetClass("X_A", kNone), &ICIMClass::EnumerateMethodDecls).front();
+  auto const copy = All(*fCopy->GetClass("X_A", kNone), &ICIMClass::EnumerateMethodDecls).front();
   EXPECT_EQ(copy->GetName(kNone), "Find");
   EXPECT_EQ(copy->GetReturnType(kNone), TType::kCIMTypeSint32);
   EXPECT_EQ(copy->GetQualifier("Description", kNone)->GetValue(kNone).ToString(), "f");
@@ -347,17 +348,17 @@ TEST_F(TCIMCopyTest, AMethodIsCopiedWithItsParametersAndTheirQualifiers) {
 // ---- Property declarations ----
 
 TEST_F(TCIMCopyTest, ADeclarationKeepsTypeBoundDefaultAndMarks) {
-  source_->DefineClass("X_A").Key("Id", "uint32").Property("Sizes", "uint8[16]").Property("Letter", "char16", TCIMChar16(67));
-  source_->DefineClass("X_B", "X_A").Property("Letter", "char16").Override().Reference("Other", "X_A");
+  fSource->DefineClass("X_A").Key("Id", "uint32").Property("Sizes", "uint8[16]").Property("Letter", "char16", TCIMChar16(67));
+  fSource->DefineClass("X_B", "X_A").Property("Letter", "char16").Override().Reference("Other", "X_A");
   CopyAll();
-  EXPECT_TRUE(Decl(*copy_, "X_A", "Id")->IsKey(kNone));
-  EXPECT_EQ(Decl(*copy_, "X_A", "Sizes")->GetDefaultValue(kNone).GetMaxArraySize(), 16u);
-  EXPECT_EQ(Decl(*copy_, "X_A", "Sizes")->GetType(kNone), TType::kCIMTypeUint8 | TType::kCIMTypeArrayFlag);
-  EXPECT_EQ(Decl(*copy_, "X_A", "Letter")->GetDefaultValue(kNone).ToString(), "67");
-  EXPECT_EQ(Decl(*copy_, "X_B", "Letter")->GetQualifier("Override", kNone)->GetValue(kNone).ToString(), "Letter");
-  const TCIMValue other = Decl(*copy_, "X_B", "Other")->GetDefaultValue(kNone);
+  EXPECT_TRUE(Decl(*fCopy, "X_A", "Id")->IsKey(kNone));
+  EXPECT_EQ(Decl(*fCopy, "X_A", "Sizes")->GetDefaultValue(kNone).GetMaxArraySize(), 16u);
+  EXPECT_EQ(Decl(*fCopy, "X_A", "Sizes")->GetType(kNone), TType::kCIMTypeUint8 | TType::kCIMTypeArrayFlag);
+  EXPECT_EQ(Decl(*fCopy, "X_A", "Letter")->GetDefaultValue(kNone).ToString(), "67");
+  EXPECT_EQ(Decl(*fCopy, "X_B", "Letter")->GetQualifier("Override", kNone)->GetValue(kNone).ToString(), "Letter");
+  TCIMValue const other = Decl(*fCopy, "X_B", "Other")->GetDefaultValue(kNone);
   EXPECT_TRUE(other.IsReference() && other.IsNull());
-  EXPECT_EQ(other.GetReferencedClass(), copy_->GetClass("X_A", kNone));
+  EXPECT_EQ(other.GetReferencedClass(), fCopy->GetClass("X_A", kNone));
 }
 
 TEST_F(TCIMCopyTest, ADeclarationThatThrowsIsSkippedWithOneLine) {
@@ -374,7 +375,7 @@ TEST_F(TCIMCopyTest, ADeclarationThatThrowsIsSkippedWithOneLine) {
     SCOPED_TRACE(row.call);
     TTrace trace;
     trace.fOnCall[row.call] = [] { throw TZEPException(kZEPStatusNotFound); };
-    const auto source = NewNamespace();
+    auto const source = NewNamespace();
     source->DefineClass("X_A");
     source->DefineClass("X_B")
         .Property("First", "string")
@@ -382,9 +383,9 @@ TEST_F(TCIMCopyTest, ADeclarationThatThrowsIsSkippedWithOneLine) {
         .Qualifier("Weak", true)
         .Property("Last", "string")
         .Method("Reset", "uint32");
-    const auto copy = NewNamespace();
+    auto const copy = NewNamespace();
     OnNewThread([&] {
-      const TLogCapture log;
+      TLogCapture const log;
       TCIMCopy::CopyClasses(boost::make_shared<TTracedNamespace>(trace, source, "src"),
                             boost::make_shared<TTracedNamespace>(trace, copy, "dst"), false);
       EXPECT_THAT(log.Entries(), ElementsAre(kLine));
@@ -395,38 +396,38 @@ TEST_F(TCIMCopyTest, ADeclarationThatThrowsIsSkippedWithOneLine) {
 }
 
 TEST_F(TCIMCopyTest, ADeclarationThatRefersToAClassThatIsNotThereYetIsSkipped) {
-  const auto early = source_->DefineClass("X_Early").Class();
-  source_->DefineClass("X_Late");
+  auto const early = fSource->DefineClass("X_Early").Class();
+  fSource->DefineClass("X_Late");
   TCIMValue reference = NullOf("reference");
-  reference.SetReferencedClass(source_->GetClass("X_Late", kNone));
+  reference.SetReferencedClass(fSource->GetClass("X_Late", kNone));
   early->AddPropertyDecl("Late", reference, kNone);
   OnNewThread([&] {
-    const TLogCapture log;
+    TLogCapture const log;
     CopyAll();
     EXPECT_THAT(log.Entries(), ElementsAre(kLine));
   });
-  EXPECT_FALSE(Decl(*copy_, "X_Early", "Late"));
+  EXPECT_FALSE(Decl(*fCopy, "X_Early", "Late"));
 }
 
 TEST_F(TCIMCopyTest, OtherExceptionsOfADeclarationPassThroughAndTheClassIsToldOfTheEnd) {
-  source_->DefineClass("X_A").Property("Bad", "string");
-  trace_.fOnCall["AddPropertyDecl dst:X_A.Bad"] = [] { throw std::runtime_error("no memory"); };
+  fSource->DefineClass("X_A").Property("Bad", "string");
+  fTrace.fOnCall["AddPropertyDecl dst:X_A.Bad"] = [] { throw std::runtime_error("no memory"); };
   EXPECT_THROW(CopyTraced(), std::runtime_error);
-  EXPECT_EQ(trace_.fCalls.back(), "EndDeclarations dst:X_A");
+  EXPECT_EQ(fTrace.fCalls.back(), "EndDeclarations dst:X_A");
 }
 
 TEST_F(TCIMCopyTest, AStaticPropertyOfASkippedDeclarationEndsTheCopy) {
-  source_->DefineClass("X_A").Static("Count", "uint16", 1);
+  fSource->DefineClass("X_A").Static("Count", "uint16", 1);
   FailOn("AddPropertyDecl dst:X_A.Count");
   EXPECT_STATUS(CopyTraced(), kZEPStatusNotFound);
 }
 
 TEST_F(TCIMCopyTest, AStaticPropertyIsCopiedWithItsValue) {
-  source_->DefineClass("X_A").Static("Count", "uint16", 2);
-  source_->DefineClass("X_B", "X_A").Class()->SetStaticProperty("Count", TCIMValue(static_cast<unsigned short>(3)), kNone);
+  fSource->DefineClass("X_A").Static("Count", "uint16", 2);
+  fSource->DefineClass("X_B", "X_A").Class()->SetStaticProperty("Count", TCIMValue(static_cast<unsigned short>(3)), kNone);
   CopyAll();
   for (auto const& [name, text] : {std::pair("X_A", "2"), std::pair("X_B", "3")}) {
-    auto const values = All(*copy_->GetClass(name, kNone), &ICIMClass::EnumerateStaticProperties);
+    auto const values = All(*fCopy->GetClass(name, kNone), &ICIMClass::EnumerateStaticProperties);
     ASSERT_EQ(values.size(), 1u);
     EXPECT_EQ(values.front()->GetValue(kNone).ToString(), text);
   }
@@ -435,43 +436,43 @@ TEST_F(TCIMCopyTest, AStaticPropertyIsCopiedWithItsValue) {
 // ---- A destination that is gone ----
 
 TEST_F(TCIMCopyTest, AStepGoesOnWithoutItsNamespace) {
-  const auto cls =
-      source_->DefineClass("X_A").Property("Plain", "string").Property("Marked", "string").Qualifier("Read", true).Class();
-  const auto target = boost::static_pointer_cast<ICIMClass>(copy_->DefineClass("X_A").Class());
+  auto const cls =
+      fSource->DefineClass("X_A").Property("Plain", "string").Property("Marked", "string").Qualifier("Read", true).Class();
+  auto const target = boost::static_pointer_cast<ICIMClass>(fCopy->DefineClass("X_A").Class());
   boost::weak_ptr<ICIMNamespace> gone;
   {
-    const auto expired = NewNamespace();
+    auto const expired = NewNamespace();
     gone = expired;
   }
   TCopyPropertyDecl copyDeclaration(gone, target);
   OnNewThread([&] {
-    const TLogCapture log;
+    TLogCapture const log;
     for (auto const& decl : All(*cls, &ICIMClass::EnumeratePropertyDecls)) EXPECT_TRUE(copyDeclaration(decl));
     // What needs no namespace is done all the same; a qualifier needs it. GetPropertyDecl throws for an unknown name here.
     EXPECT_THAT(log.Entries(), ElementsAre(kLine, kLine));
   });
   target->BeginDeclarations(kNone);
   OnNewThread([&] {
-    const TLogCapture log;
+    TLogCapture const log;
     for (auto const& decl : All(*cls, &ICIMClass::EnumeratePropertyDecls)) EXPECT_TRUE(copyDeclaration(decl));
     EXPECT_THAT(log.Entries(), ElementsAre(kLine));
   });
   EXPECT_THAT(Names(*target, &ICIMClass::EnumeratePropertyDecls), ElementsAre("Plain", "Marked"));
 
-  EXPECT_STATUS(TCopyQualifierDecls{gone}(source_->GetQualifierDecl("Key", kNone)), kZEPStatusFail);
+  EXPECT_STATUS(TCopyQualifierDecls{gone}(fSource->GetQualifierDecl("Key", kNone)), kZEPStatusFail);
   EXPECT_STATUS((TCopyClass{gone, false, false}(cls)), kZEPStatusFail);
   EXPECT_STATUS((TCopyClassTree{gone, false, false}(cls)), kZEPStatusFail);
   EXPECT_TRUE((TCopyClassTree{gone, true, false}(cls)));  // of the other pass: nothing is written
 }
 
 TEST_F(TCIMCopyTest, StepsThatNeedNoNamespaceAreDoneWithoutOne) {
-  const auto cls =
-      source_->DefineClass("X_A").Static("Count", "uint16", 1).Property("Name", "string").Method("Reset", "uint32").Class();
-  const auto target = copy_->DefineClass("X_A").Property("Count", "uint16").Property("Name", "string").Class();
+  auto const cls =
+      fSource->DefineClass("X_A").Static("Count", "uint16", 1).Property("Name", "string").Method("Reset", "uint32").Class();
+  auto const target = fCopy->DefineClass("X_A").Property("Count", "uint16").Property("Name", "string").Class();
   cls->AddMethodDecl("Stop", TType::kCIMTypeUint32, kNone)->AddParameterDecl("Force", TType::kCIMTypeBoolean, 0, "", kNone);
-  const auto instance = source_->AddInstance("X_A", {{"Name", "a"}});
-  const auto copiedInstance = target->CreateInstance(kNone);
-  const boost::weak_ptr<ICIMNamespace> gone;
+  auto const instance = fSource->AddInstance("X_A", {{"Name", "a"}});
+  auto const copiedInstance = target->CreateInstance(kNone);
+  boost::weak_ptr<ICIMNamespace> const gone;
 
   cls->EnumerateStaticProperties(TCopyStaticProperty(gone, target), kNone);
   cls->EnumerateMethodDecls(TCopyMethodDecl(gone, target), kNone);
@@ -481,41 +482,41 @@ TEST_F(TCIMCopyTest, StepsThatNeedNoNamespaceAreDoneWithoutOne) {
   EXPECT_THAT(Names(*target, &ICIMClass::EnumerateMethodDecls), ElementsAre("Reset", "Stop"));
   EXPECT_EQ(copiedInstance->GetProperty("Name", kNone)->GetValue(kNone).ToString(), "a");
 
-  cls->AddQualifier(source_->GetQualifierDecl("Description", kNone), TCIMValue("a"), 0, kNone);
+  cls->AddQualifier(fSource->GetQualifierDecl("Description", kNone), TCIMValue("a"), 0, kNone);
   EXPECT_STATUS(cls->EnumerateQualifiers(TCopyQualifier(gone, target), kNone), kZEPStatusFail);
 }
 
 TEST_F(TCIMCopyTest, EachStepCalledByItselfReturnsTrueAndNeedsTheNamespaceForQualifiersOnly) {
-  const auto cls = source_->DefineClass("X_A")
+  auto const cls = fSource->DefineClass("X_A")
                        .Description("a")
                        .Static("Count", "uint16", 1)
                        .Property("Name", "string")
                        .Method("Reset", "uint32")
                        .Class();
-  const auto method = All(*cls, &ICIMClass::EnumerateMethodDecls).front();
-  const auto parameter = method->AddParameterDecl("Force", TType::kCIMTypeBoolean, 0, "", kNone);
-  const auto qualifier = cls->GetQualifier("Description", kNone);
-  const auto count = All(*cls, &ICIMClass::EnumerateStaticProperties).front();
-  const auto name = source_->AddInstance("X_A", {{"Name", "a"}})->GetProperty("Name", kNone);
+  auto const method = All(*cls, &ICIMClass::EnumerateMethodDecls).front();
+  auto const parameter = method->AddParameterDecl("Force", TType::kCIMTypeBoolean, 0, "", kNone);
+  auto const qualifier = cls->GetQualifier("Description", kNone);
+  auto const count = All(*cls, &ICIMClass::EnumerateStaticProperties).front();
+  auto const name = fSource->AddInstance("X_A", {{"Name", "a"}})->GetProperty("Name", kNone);
 
   for (bool isExpired : {false, true}) {
     SCOPED_TRACE(isExpired);
-    const auto copy = NewNamespace();
-    const auto target = copy->DefineClass("X_A").Property("Count", "uint16").Property("Name", "string").Class();
+    auto const copy = NewNamespace();
+    auto const target = copy->DefineClass("X_A").Property("Count", "uint16").Property("Name", "string").Class();
     boost::shared_ptr<ICIMNamespace> other = NewNamespace();
-    const boost::weak_ptr<ICIMNamespace> destination = isExpired ? other : copy;
+    boost::weak_ptr<ICIMNamespace> const destination = isExpired ? other : copy;
     other.reset();
     ASSERT_EQ(destination.expired(), isExpired);
 
     EXPECT_TRUE(::TCopyStaticProperty(destination, target)(count));
     EXPECT_EQ(All(*target, &ICIMClass::EnumerateStaticProperties).front()->GetValue(kNone).ToString(), "1");
     EXPECT_TRUE(::TCopyMethodDecl(destination, target)(method));
-    const auto copiedMethod = All(*target, &ICIMClass::EnumerateMethodDecls).front();
+    auto const copiedMethod = All(*target, &ICIMClass::EnumerateMethodDecls).front();
     EXPECT_THAT(Names(*copiedMethod, &ICIMMethodDecl::EnumerateParameterDecls), ElementsAre("Force"));
-    const auto plain = target->AddMethodDecl("Plain", TType::kCIMTypeUint32, kNone);
+    auto const plain = target->AddMethodDecl("Plain", TType::kCIMTypeUint32, kNone);
     EXPECT_TRUE(::TCopyParameterDecl(destination, plain)(parameter));
     EXPECT_THAT(Names(*plain, &ICIMMethodDecl::EnumerateParameterDecls), ElementsAre("Force"));
-    const auto instance = target->CreateInstance(kNone);
+    auto const instance = target->CreateInstance(kNone);
     EXPECT_TRUE(::TCopyInstanceProperty(destination, instance)(name));
     EXPECT_EQ(instance->GetProperty("Name", kNone)->GetValue(kNone).ToString(), "a");
 
@@ -531,22 +532,22 @@ TEST_F(TCIMCopyTest, EachStepCalledByItselfReturnsTrueAndNeedsTheNamespaceForQua
 }
 
 TEST_F(TCIMCopyTest, TheStepsForDeclarationsClassesAndKeysReturnTrue) {
-  source_->DefineClass("X_A").Key("Id", "uint32");
-  const auto cls = source_->GetClass("X_A", kNone);
-  const auto bare = boost::make_shared<TMemoryNamespace>("root/bare");
-  const auto key = source_->GetQualifierDecl("Key", kNone);
+  fSource->DefineClass("X_A").Key("Id", "uint32");
+  auto const cls = fSource->GetClass("X_A", kNone);
+  auto const bare = boost::make_shared<TMemoryNamespace>("root/bare");
+  auto const key = fSource->GetQualifierDecl("Key", kNone);
   EXPECT_TRUE(::TCopyQualifierDecls{bare}(key));
   EXPECT_TRUE((::TCopyClass{bare, true, false}(cls)));  // of the other pass
   EXPECT_THAT(ClassNames(*bare), IsEmpty());
   EXPECT_TRUE((::TCopyClass{bare, false, false}(cls)));
   EXPECT_THAT(ClassNames(*bare), ElementsAre("X_A"));
-  copy_->CreateQualifierDecl("Key", TCIMValue(false), ICIMQualifierDecl::kScopeAny, 0, kNone);
-  EXPECT_TRUE((::TCopyClassTree{copy_, false, false}(cls)));
-  EXPECT_THAT(ClassNames(*copy_), ElementsAre("X_A"));
+  fCopy->CreateQualifierDecl("Key", TCIMValue(false), ICIMQualifierDecl::kScopeAny, 0, kNone);
+  EXPECT_TRUE((::TCopyClassTree{fCopy, false, false}(cls)));
+  EXPECT_THAT(ClassNames(*fCopy), ElementsAre("X_A"));
 
-  TCIMReference path(copy_, kNone);
-  path.SetClass(copy_->GetClass("X_A", kNone));
-  EXPECT_TRUE((::TCopyReferenceKeys{copy_, path}(std::make_pair(std::string("Id"), TCIMValue(7u)))));
+  TCIMReference path(fCopy, kNone);
+  path.SetClass(fCopy->GetClass("X_A", kNone));
+  EXPECT_TRUE((::TCopyReferenceKeys{fCopy, path}(std::make_pair(std::string("Id"), TCIMValue(7u)))));
   EXPECT_EQ(path.GetPath(), "X_A.Id=\"7\"");
 }
 
@@ -554,42 +555,42 @@ TEST_F(TCIMCopyTest, TheStepsForDeclarationsClassesAndKeysReturnTrue) {
 
 class ProductCopyTest : public TCIMCopyTest {
 protected:
-  ProductCopyTest() { source_->DefineClass("QRVSG_ZEPProduct").Key("Name", "string").Property("Version", "string", "0"); }
+  ProductCopyTest() { fSource->DefineClass("QRVSG_ZEPProduct").Key("Name", "string").Property("Version", "string", "0"); }
 
-  std::vector<std::string> CopiedProducts() const { return InstancePaths(*copy_->GetClass("QRVSG_ZEPProduct", kNone)); }
+  std::vector<std::string> CopiedProducts() const { return InstancePaths(*fCopy->GetClass("QRVSG_ZEPProduct", kNone)); }
 };
 
 TEST_F(ProductCopyTest, TheInstancesOfTheProductClassAreCopied) {
-  source_->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}, {"Version", "1.2"}});
-  source_->AddInstance("QRVSG_ZEPProduct", {{"Name", "b"}});
+  fSource->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}, {"Version", "1.2"}});
+  fSource->AddInstance("QRVSG_ZEPProduct", {{"Name", "b"}});
   CopyAll();
   EXPECT_THAT(CopiedProducts(), ElementsAre("QRVSG_ZEPProduct.Name=\"a\"", "QRVSG_ZEPProduct.Name=\"b\""));
-  auto const first = All(*copy_->GetClass("QRVSG_ZEPProduct", kNone), &ICIMClass::EnumerateInstances).front();
+  auto const first = All(*fCopy->GetClass("QRVSG_ZEPProduct", kNone), &ICIMClass::EnumerateInstances).front();
   EXPECT_EQ(first->GetProperty("Version", kNone)->GetValue(kNone).ToString(), "1.2");
 }
 
 TEST_F(ProductCopyTest, WithTheFlagNoInstanceIsCopied) {
-  source_->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
+  fSource->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
   CopyTraced(true);
   EXPECT_THAT(CopiedProducts(), IsEmpty());
-  EXPECT_THAT(trace_.fCalls, Contains("EnumerateInstances src:QRVSG_ZEPProduct"));
-  EXPECT_THAT(trace_.fCalls, Not(Contains("CreateInstance dst:QRVSG_ZEPProduct")));
+  EXPECT_THAT(fTrace.fCalls, Contains("EnumerateInstances src:QRVSG_ZEPProduct"));
+  EXPECT_THAT(fTrace.fCalls, Not(Contains("CreateInstance dst:QRVSG_ZEPProduct")));
 }
 
 TEST_F(ProductCopyTest, InstancesOfOtherClassesAndOfSubclassesAreNotCopied) {
-  source_->DefineClass("X_Product", "QRVSG_ZEPProduct");
-  source_->DefineClass("qrvsg_Disk").Key("Id", "uint32");
-  source_->AddInstance("X_Product", {{"Name", "sub"}});
-  source_->AddInstance("qrvsg_Disk", {{"Id", 1}});
-  source_->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
+  fSource->DefineClass("X_Product", "QRVSG_ZEPProduct");
+  fSource->DefineClass("qrvsg_Disk").Key("Id", "uint32");
+  fSource->AddInstance("X_Product", {{"Name", "sub"}});
+  fSource->AddInstance("qrvsg_Disk", {{"Id", 1}});
+  fSource->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
   CopyAll();
   EXPECT_THAT(CopiedProducts(), ElementsAre("QRVSG_ZEPProduct.Name=\"a\""));
-  EXPECT_THAT(InstancePaths(*copy_->GetClass("X_Product", kNone)), IsEmpty());
-  EXPECT_THAT(InstancePaths(*copy_->GetClass("qrvsg_Disk", kNone)), IsEmpty());
+  EXPECT_THAT(InstancePaths(*fCopy->GetClass("X_Product", kNone)), IsEmpty());
+  EXPECT_THAT(InstancePaths(*fCopy->GetClass("qrvsg_Disk", kNone)), IsEmpty());
 }
 
 TEST(ProductClassNameTest, CaseMatters) {
-  const auto source = NewNamespace(), copy = NewNamespace();
+  auto const source = NewNamespace(), copy = NewNamespace();
   source->DefineClass("qrvsg_zepproduct").Key("Name", "string");
   source->AddInstance("qrvsg_zepproduct", {{"Name", "a"}});
   TCIMCopy::CopyClasses(source, copy, false);
@@ -597,10 +598,10 @@ TEST(ProductClassNameTest, CaseMatters) {
 }
 
 TEST_F(ProductCopyTest, AProductClassOfAPlugInHasItsInstancesLeftOut) {
-  source_->CreateQualifierDecl("PLUGINNAME", NullOf("string"), ICIMQualifierDecl::kScopeAny, 0, kNone);
-  source_->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
-  source_->GetClass("QRVSG_ZEPProduct", kNone)
-      ->AddQualifier(source_->GetQualifierDecl("PLUGINNAME", kNone), TCIMValue("Clock"), 0, kNone);
+  fSource->CreateQualifierDecl("PLUGINNAME", NullOf("string"), ICIMQualifierDecl::kScopeAny, 0, kNone);
+  fSource->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
+  fSource->GetClass("QRVSG_ZEPProduct", kNone)
+      ->AddQualifier(fSource->GetQualifierDecl("PLUGINNAME", kNone), TCIMValue("Clock"), 0, kNone);
   CopyTraced();
   EXPECT_THAT(CopiedProducts(), IsEmpty());
   EXPECT_THAT(Calls({"GetQualifier src:", "IsAbstract", "EnumerateInstances"}),
@@ -609,70 +610,70 @@ TEST_F(ProductCopyTest, AProductClassOfAPlugInHasItsInstancesLeftOut) {
 }
 
 TEST_F(ProductCopyTest, AnAbstractProductClassHasItsInstancesLeftOut) {
-  const auto source = NewNamespace();
+  auto const source = NewNamespace();
   source->DefineClass("QRVSG_ZEPProduct").Abstract().Key("Name", "string");
-  TCIMCopy::CopyClasses(Traced(source, "src"), copy_, false);
-  EXPECT_THAT(trace_.fCalls, Not(Contains("EnumerateInstances src:QRVSG_ZEPProduct")));
+  TCIMCopy::CopyClasses(Traced(source, "src"), fCopy, false);
+  EXPECT_THAT(fTrace.fCalls, Not(Contains("EnumerateInstances src:QRVSG_ZEPProduct")));
 }
 
 TEST_F(ProductCopyTest, TheProductClassMayBeAnAssociation) {
-  const auto source = NewNamespace();
+  auto const source = NewNamespace();
   source->DefineClass("QRVSG_ZEPProduct").Association().Key("Name", "string");
   source->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
-  TCIMCopy::CopyClasses(source, copy_, false);
+  TCIMCopy::CopyClasses(source, fCopy, false);
   EXPECT_THAT(CopiedProducts(), ElementsAre("QRVSG_ZEPProduct.Name=\"a\""));
 
-  copy_ = NewNamespace();
-  TCIMCopy::CopyClasses(source, copy_, true);
+  fCopy = NewNamespace();
+  TCIMCopy::CopyClasses(source, fCopy, true);
   EXPECT_THAT(CopiedProducts(), IsEmpty());
 }
 
 TEST_F(ProductCopyTest, AnInstanceThatIsRefusedEndsTheCopy) {
-  source_->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
-  source_->DefineClass("X_Later");
+  fSource->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
+  fSource->DefineClass("X_Later");
   FailOn("CommitInstance dst:QRVSG_ZEPProduct", kZEPStatusAlreadyExists);
   EXPECT_STATUS(CopyTraced(), kZEPStatusAlreadyExists);
-  EXPECT_THAT(ClassNames(*copy_), ElementsAre("QRVSG_ZEPProduct"));
+  EXPECT_THAT(ClassNames(*fCopy), ElementsAre("QRVSG_ZEPProduct"));
 }
 
 TEST_F(ProductCopyTest, AnInstanceIsCopiedStepByStep) {
-  source_->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}, {"Version", TCIMValue()}});
+  fSource->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}, {"Version", TCIMValue()}});
   CopyAll(true);
-  auto const source = All(*Traced(source_, "src")->GetClass("QRVSG_ZEPProduct", kNone), &ICIMClass::EnumerateInstances).front();
-  trace_.fCalls.clear();
-  TCIMCopy::CopyInstance(source, Traced(copy_, "dst"));
-  EXPECT_THAT(trace_.fCalls, ElementsAre("GetClass of instance src:QRVSG_ZEPProduct", "GetClass dst:QRVSG_ZEPProduct",
+  auto const source = All(*Traced(fSource, "src")->GetClass("QRVSG_ZEPProduct", kNone), &ICIMClass::EnumerateInstances).front();
+  fTrace.fCalls.clear();
+  TCIMCopy::CopyInstance(source, Traced(fCopy, "dst"));
+  EXPECT_THAT(fTrace.fCalls, ElementsAre("GetClass of instance src:QRVSG_ZEPProduct", "GetClass dst:QRVSG_ZEPProduct",
                                          "CreateInstance dst:QRVSG_ZEPProduct", "EnumerateProperties src:QRVSG_ZEPProduct",
                                          "GetProperty dst:QRVSG_ZEPProduct.Name", "CommitInstance dst:QRVSG_ZEPProduct"));
-  auto const copy = All(*copy_->GetClass("QRVSG_ZEPProduct", kNone), &ICIMClass::EnumerateInstances).front();
+  auto const copy = All(*fCopy->GetClass("QRVSG_ZEPProduct", kNone), &ICIMClass::EnumerateInstances).front();
   EXPECT_EQ(copy->GetProperty("Version", kNone)->GetValue(kNone).ToString(), "0");  // the default, not NULL
 }
 
 TEST_F(ProductCopyTest, AnInstanceOfAClassThatTheDestinationLacksIsRefused) {
-  const auto instance = source_->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
-  EXPECT_STATUS(TCIMCopy::CopyInstance(instance, copy_), kZEPStatusNotFound);
+  auto const instance = fSource->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
+  EXPECT_STATUS(TCIMCopy::CopyInstance(instance, fCopy), kZEPStatusNotFound);
 }
 
 TEST_F(ProductCopyTest, APropertyThatTheDestinationLacksIsNotFound) {
-  const auto instance = source_->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}, {"Version", "1"}});
-  copy_->DefineClass("QRVSG_ZEPProduct").Key("Name", "string");
-  EXPECT_STATUS(TCIMCopy::CopyInstance(instance, copy_), kZEPStatusNotFound);
+  auto const instance = fSource->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}, {"Version", "1"}});
+  fCopy->DefineClass("QRVSG_ZEPProduct").Key("Name", "string");
+  EXPECT_STATUS(TCIMCopy::CopyInstance(instance, fCopy), kZEPStatusNotFound);
   EXPECT_THAT(CopiedProducts(), IsEmpty());
 }
 
 TEST_F(ProductCopyTest, AnInstanceOfAnyClassCanBeCopiedByItself) {
-  source_->DefineClass("X_Disk").Key("Id", "uint32").Property("Sizes", "uint64[4]");
-  source_->DefineClass("X_Link").Association().KeyReference("Disk", "X_Disk").Key("Port", "sint8");
-  const TCIMValue sizes(TType::kCIMTypeUint64, 4, {TCIMValue(1ul), TCIMValue(2ul)});
-  const auto disk = source_->AddInstance("X_Disk", {{"Id", 7}, {"Sizes", sizes}});
-  const auto link = source_->AddInstance("X_Link", {{"Disk", disk->GetReference()}, {"Port", -1}});
+  fSource->DefineClass("X_Disk").Key("Id", "uint32").Property("Sizes", "uint64[4]");
+  fSource->DefineClass("X_Link").Association().KeyReference("Disk", "X_Disk").Key("Port", "sint8");
+  TCIMValue const sizes(TType::kCIMTypeUint64, 4, {TCIMValue(1ul), TCIMValue(2ul)});
+  auto const disk = fSource->AddInstance("X_Disk", {{"Id", 7}, {"Sizes", sizes}});
+  auto const link = fSource->AddInstance("X_Link", {{"Disk", disk->GetReference()}, {"Port", -1}});
   CopyAll(true);
-  TCIMCopy::CopyInstance(disk, copy_);
-  TCIMCopy::CopyInstance(link, copy_);
-  EXPECT_THAT(InstancePaths(*copy_->GetClass("X_Link", kNone)), ElementsAre("X_Link.Disk=\"X_Disk.Id=\"7\"\",Port=\"-1\""));
-  auto const copiedLink = All(*copy_->GetClass("X_Link", kNone), &ICIMClass::EnumerateInstances).front();
+  TCIMCopy::CopyInstance(disk, fCopy);
+  TCIMCopy::CopyInstance(link, fCopy);
+  EXPECT_THAT(InstancePaths(*fCopy->GetClass("X_Link", kNone)), ElementsAre("X_Link.Disk=\"X_Disk.Id=\"7\"\",Port=\"-1\""));
+  auto const copiedLink = All(*fCopy->GetClass("X_Link", kNone), &ICIMClass::EnumerateInstances).front();
   TCIMReference const reference = copiedLink->GetProperty("Disk", kNone)->GetValue(kNone);
-  auto const copiedDisk = All(*copy_->GetClass("X_Disk", kNone), &ICIMClass::EnumerateInstances).front();
+  auto const copiedDisk = All(*fCopy->GetClass("X_Disk", kNone), &ICIMClass::EnumerateInstances).front();
   EXPECT_EQ(reference.GetCIMElement(false), copiedDisk);
   EXPECT_EQ(copiedDisk->GetProperty("Sizes", kNone)->GetValue(kNone), sizes);
 }
@@ -680,12 +681,12 @@ TEST_F(ProductCopyTest, AnInstanceOfAnyClassCanBeCopiedByItself) {
 // ---- Values ----
 
 TEST_F(TCIMCopyTest, AValueThatIsNoReferenceComesBackAsItIs) {
-  const boost::shared_ptr<ICIMNamespace> none;  // it is not asked for
+  boost::shared_ptr<ICIMNamespace> const none;  // it is not asked for
   for (TCIMValue const& value :
        {TCIMValue(), TCIMValue(true), TCIMValue(5u), TCIMValue("a\"b"), TCIMValue(1.5), NullOf("string[4]"), NullOf("uint8"),
         NullOf("reference[3]"), TCIMValue(TType::kCIMTypeString, 2, {TCIMValue("x"), TCIMValue("y")})}) {
     SCOPED_TRACE(value.IsNull() ? "NULL" : value.ToString());
-    const TCIMValue copy = TCIMCopy::CopyValue(value, none);
+    TCIMValue const copy = TCIMCopy::CopyValue(value, none);
     EXPECT_EQ(copy, value);
     EXPECT_EQ(copy.GetType(), value.GetType());
     EXPECT_EQ(copy.GetMaxArraySize(), value.GetMaxArraySize());
@@ -693,51 +694,51 @@ TEST_F(TCIMCopyTest, AValueThatIsNoReferenceComesBackAsItIs) {
 }
 
 TEST_F(TCIMCopyTest, ANullReferenceRefersToTheClassOfTheSameNameInTheDestination) {
-  source_->DefineClass("X_Disk");
-  copy_->DefineClass("X_Disk");
+  fSource->DefineClass("X_Disk");
+  fCopy->DefineClass("X_Disk");
   TCIMValue value = NullOf("reference");
-  value.SetReferencedClass(source_->GetClass("X_Disk", kNone));
-  const TCIMValue copy = TCIMCopy::CopyValue(value, copy_);
+  value.SetReferencedClass(fSource->GetClass("X_Disk", kNone));
+  TCIMValue const copy = TCIMCopy::CopyValue(value, fCopy);
   EXPECT_TRUE(copy.IsNull());
   EXPECT_TRUE(copy.IsReference());
-  EXPECT_EQ(copy.GetReferencedClass(), copy_->GetClass("X_Disk", kNone));
+  EXPECT_EQ(copy.GetReferencedClass(), fCopy->GetClass("X_Disk", kNone));
 
   EXPECT_STATUS(TCIMCopy::CopyValue(value, NewNamespace()), kZEPStatusNotFound);
   EXPECT_STATUS(TCIMCopy::CopyValue(value, boost::shared_ptr<ICIMNamespace>()), kZEPStatusFail);
 }
 
 TEST_F(TCIMCopyTest, ANullReferenceToNoClassStaysOne) {
-  const TCIMValue copy = TCIMCopy::CopyValue(NullOf("reference"), copy_);
+  TCIMValue const copy = TCIMCopy::CopyValue(NullOf("reference"), fCopy);
   EXPECT_TRUE(copy.IsReference() && copy.IsNull());
   EXPECT_FALSE(copy.GetReferencedClass());
 }
 
 TEST_F(TCIMCopyTest, AReferenceTakesItsKeysAlongAtAnyDepth) {
-  source_->DefineClass("X_Disk").Key("Id", "uint32").Key("Name", "string");
-  source_->DefineClass("X_Link").KeyReference("Disk", "X_Disk");
+  fSource->DefineClass("X_Disk").Key("Id", "uint32").Key("Name", "string");
+  fSource->DefineClass("X_Link").KeyReference("Disk", "X_Disk");
   CopyAll();
-  const auto disk = source_->AddInstance("X_Disk", {{"Id", 5}, {"Name", "a\"b"}});
-  const TCIMValue value = source_->AddInstance("X_Link", {{"Disk", disk->GetReference()}})->GetReference();
+  auto const disk = fSource->AddInstance("X_Disk", {{"Id", 5}, {"Name", "a\"b"}});
+  TCIMValue const value = fSource->AddInstance("X_Link", {{"Disk", disk->GetReference()}})->GetReference();
 
-  const TCIMValue copy = TCIMCopy::CopyValue(value, copy_);
+  TCIMValue const copy = TCIMCopy::CopyValue(value, fCopy);
   EXPECT_EQ(copy.ToString(), value.ToString());
-  EXPECT_EQ(copy.GetReferencedClass(), copy_->GetClass("X_Link", kNone));
-  const TCIMReference path = copy;
-  EXPECT_EQ(path.GetNamespace(), copy_);
+  EXPECT_EQ(copy.GetReferencedClass(), fCopy->GetClass("X_Link", kNone));
+  TCIMReference const path = copy;
+  EXPECT_EQ(path.GetNamespace(), fCopy);
   path.EnumerateKeyBindings([&](std::pair<std::string, TCIMValue> const& key) {
-    EXPECT_EQ(key.second.GetReferencedClass(), copy_->GetClass("X_Disk", kNone));
+    EXPECT_EQ(key.second.GetReferencedClass(), fCopy->GetClass("X_Disk", kNone));
     return true;
   });
 }
 
 TEST_F(TCIMCopyTest, TheElementsOfAnArrayOfReferencesAreCopiedToo) {
-  source_->DefineClass("X_Disk").Key("Id", "uint32");
+  fSource->DefineClass("X_Disk").Key("Id", "uint32");
   CopyAll();
-  const TCIMValue element = source_->AddInstance("X_Disk", {{"Id", 5}})->GetReference();
-  const TCIMValue copy = TCIMCopy::CopyValue(TCIMValue(TType::kCIMTypeReference, 3, {element}), copy_);
+  TCIMValue const element = fSource->AddInstance("X_Disk", {{"Id", 5}})->GetReference();
+  TCIMValue const copy = TCIMCopy::CopyValue(TCIMValue(TType::kCIMTypeReference, 3, {element}), fCopy);
   std::vector<TCIMValue> const& elements = copy;
   ASSERT_EQ(elements.size(), 1u);
-  EXPECT_EQ(elements[0].GetReferencedClass(), copy_->GetClass("X_Disk", kNone));
+  EXPECT_EQ(elements[0].GetReferencedClass(), fCopy->GetClass("X_Disk", kNone));
   EXPECT_EQ(elements[0].ToString(), "X_Disk.Id=\"5\"");
   EXPECT_EQ(copy.GetMaxArraySize(), 3u);
 }
@@ -750,7 +751,7 @@ TEST(CopyThreadsTest, ThreadsCopyInstancesAtOnce) {
   std::atomic<int> copied{0};
   for (int number = 0; number < 4; ++number)
     threads.emplace_back([&copied] {
-      const auto source = NewNamespace(), copy = NewNamespace();
+      auto const source = NewNamespace(), copy = NewNamespace();
       source->DefineClass("X_A").Key("Id", "uint32");
       copy->DefineClass("X_A").Key("Id", "uint32");
       for (int id = 0; id < 50; ++id) TCIMCopy::CopyInstance(source->AddInstance("X_A", {{"Id", id}}), copy);
@@ -762,7 +763,7 @@ TEST(CopyThreadsTest, ThreadsCopyInstancesAtOnce) {
 
 // Two threads copy into one namespace, which only one of them may touch at a time.
 TEST(CopyThreadsTest, TwoThreadsCopyIntoOneNamespace) {
-  const auto source = NewNamespace(), copy = NewNamespace();
+  auto const source = NewNamespace(), copy = NewNamespace();
   source->DefineClass("X_A").Key("Id", "uint32");
   copy->DefineClass("X_A").Key("Id", "uint32");
   std::vector<boost::shared_ptr<ICIMInstance>> instances;
@@ -777,14 +778,14 @@ TEST(CopyThreadsTest, TwoThreadsCopyIntoOneNamespace) {
 }
 
 TEST(CopyThreadsTest, AnotherThreadWaitsButTheSameOneDoesNot) {
-  const auto source = NewNamespace(), copy = NewNamespace();
+  auto const source = NewNamespace(), copy = NewNamespace();
   source->DefineClass("X_A").Key("Id", "uint32");
   copy->DefineClass("X_A").Key("Id", "uint32");
-  const auto first = source->AddInstance("X_A", {{"Id", 1}}), second = source->AddInstance("X_A", {{"Id", 2}});
+  auto const first = source->AddInstance("X_A", {{"Id", 1}}), second = source->AddInstance("X_A", {{"Id", 2}});
   std::atomic<bool> isDone{false};
   std::thread other;
   {
-    const boost::recursive_mutex::scoped_lock lock(copyInstMutex);
+    boost::recursive_mutex::scoped_lock const lock(copyInstMutex);
     TCIMCopy::CopyInstance(first, copy);  // the mutex is recursive
     other = std::thread([&] {
       TCIMCopy::CopyInstance(second, copy);
@@ -808,10 +809,10 @@ TEST(CopyThreadsTest, TheMutexIsHeldToTheCommitAndFreeAfterwards) {
   for (bool fails : {false, true}) {
     SCOPED_TRACE(fails);
     TTrace trace;
-    const auto source = NewNamespace(), copy = NewNamespace();
+    auto const source = NewNamespace(), copy = NewNamespace();
     source->DefineClass("X_A").Key("Id", "uint32");
     copy->DefineClass("X_A").Key("Id", "uint32");
-    const auto instance = source->AddInstance("X_A", {{"Id", 1}});
+    auto const instance = source->AddInstance("X_A", {{"Id", 1}});
     bool isFree = true;
     trace.fOnCall["CommitInstance dst:X_A"] = [&] {
       isFree = CanAnotherThreadLock();
@@ -828,9 +829,9 @@ TEST(CopyThreadsTest, TheMutexIsHeldToTheCommitAndFreeAfterwards) {
 }
 
 TEST(CopyThreadsTest, CopyingClassesTakesNoLock) {
-  const boost::recursive_mutex::scoped_lock lock(copyInstMutex);
+  boost::recursive_mutex::scoped_lock const lock(copyInstMutex);
   std::thread([] {
-    const auto source = NewNamespace(), copy = NewNamespace();
+    auto const source = NewNamespace(), copy = NewNamespace();
     source->DefineClass("X_A").Key("Id", "uint32");
     TCIMCopy::CopyClasses(source, copy, false);
     EXPECT_THAT(ClassNames(*copy), ElementsAre("X_A"));

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TCIMReference.h"
 
 #include "Fakes.h"
@@ -17,12 +18,12 @@ using TNames = std::vector<std::string>;
 class TCIMReferenceTest : public testing::Test {
 protected:
   TCIMReferenceTest() {
-    ns_->Add("X_Disk").Add("Id", ECIMType::kCIMTypeUint32).Add("Name", ECIMType::kCIMTypeString);
-    ns_->Add("X_Link").Add("Disk", ECIMType::kCIMTypeReference).Add("Port", ECIMType::kCIMTypeUint8);
+    fNs->Add("X_Disk").Add("Id", ECIMType::kCIMTypeUint32).Add("Name", ECIMType::kCIMTypeString);
+    fNs->Add("X_Link").Add("Disk", ECIMType::kCIMTypeReference).Add("Port", ECIMType::kCIMTypeUint8);
   }
 
-  TCIMReference Empty() const { return TCIMReference(ns_, TCIMContext()); }
-  TCIMReference Parsed(std::string const& path) const { return TCIMReference(ns_, path, TCIMContext()); }
+  TCIMReference Empty() const { return TCIMReference(fNs, TCIMContext()); }
+  TCIMReference Parsed(std::string const& path) const { return TCIMReference(fNs, path, TCIMContext()); }
 
   TCIMReference Disk(unsigned int id) const {
     TCIMReference disk = Empty();
@@ -49,7 +50,7 @@ protected:
     return found;
   }
 
-  boost::shared_ptr<TFakeNamespace> const ns_ = boost::make_shared<TFakeNamespace>();
+  boost::shared_ptr<TFakeNamespace> const fNs = boost::make_shared<TFakeNamespace>();
 };
 
 // ---- Parsing: valid paths ----
@@ -80,7 +81,7 @@ TEST_F(TCIMReferenceTest, ReadsPaths) {
     SCOPED_TRACE(row.path);
     TCIMReference const reference = Parsed(row.path);
     EXPECT_EQ(reference.GetClassName(), row.className);
-    EXPECT_EQ(reference.GetClass(), ns_->Class(row.className));
+    EXPECT_EQ(reference.GetClass(), fNs->Class(row.className));
     EXPECT_EQ(KeysOf(reference), row.keys);
   }
 }
@@ -92,13 +93,13 @@ TEST_F(TCIMReferenceTest, AKeyHasTheDeclaredType) {
 }
 
 TEST_F(TCIMReferenceTest, NumbersOfOtherTypesCanBeKeys) {
-  ns_->Class("X_Disk")->Add("Load", ECIMType::kCIMTypeReal64).Add("Offset", ECIMType::kCIMTypeSint64);
+  fNs->Class("X_Disk")->Add("Load", ECIMType::kCIMTypeReal64).Add("Offset", ECIMType::kCIMTypeSint64);
   EXPECT_EQ(KeysOf(Parsed("ns:X_Disk.Load=\"-0.5\",Offset=\"-9223372036854775808\"")),
             (TNames{"Load=-0.5", "Offset=-9223372036854775808"}));
 }
 
 TEST_F(TCIMReferenceTest, AChar16KeyIsSetButCannotBePrintedOrCompared) {
-  ns_->Class("X_Disk")->Add("Letter", ECIMType::kCIMTypeChar16);
+  fNs->Class("X_Disk")->Add("Letter", ECIMType::kCIMTypeChar16);
   TCIMReference const disk = Parsed("ns:X_Disk.Letter=\"C\"");
   EXPECT_EQ(KeyOf(disk, "Letter").GetType(), ECIMType::kCIMTypeChar16);
   EXPECT_STATUS(disk.GetPath(), kZEPStatusInvalidDateTime);
@@ -109,7 +110,7 @@ TEST_F(TCIMReferenceTest, AChar16KeyIsSetButCannotBePrintedOrCompared) {
 TEST_F(TCIMReferenceTest, WithoutNamespacePrefixAPathWithKeysIsAClassName) {
   TLogCapture log;
   EXPECT_STATUS(Parsed("X_Disk.Id=\"5\""), kZEPStatusInvalidReference);
-  EXPECT_EQ(ns_->fCalls.fNames, TNames({"X_Disk.Id=\"5\""}));
+  EXPECT_EQ(fNs->fCalls.fNames, TNames({"X_Disk.Id=\"5\""}));
   EXPECT_EQ(log.Entries(), TNames({"[Error] Reference specifies invalid class, path=X_Disk.Id=\"5\""}));
 }
 
@@ -139,9 +140,9 @@ TEST_F(TCIMReferenceTest, SplitsOffTheClassName) {
   };
   for (auto const& row : kRows) {
     SCOPED_TRACE(row.path);
-    ns_->fCalls.fNames.clear();
+    fNs->fCalls.fNames.clear();
     EXPECT_STATUS(Parsed(row.path), kZEPStatusInvalidReference);
-    EXPECT_EQ(ns_->fCalls.fNames, TNames({row.className}));
+    EXPECT_EQ(fNs->fCalls.fNames, TNames({row.className}));
   }
 }
 
@@ -173,7 +174,7 @@ TEST_F(TCIMReferenceTest, FirstOfTwoKeysOfOneNameWinsInAPath) {
 }
 
 TEST_F(TCIMReferenceTest, AnyPropertyOfTheClassMayBeAKeyOfThePath) {
-  ns_->Class("X_Disk")->Add("Seen", ECIMType::kCIMTypeBoolean).Add("Made", ECIMType::kCIMTypeDateTime);
+  fNs->Class("X_Disk")->Add("Seen", ECIMType::kCIMTypeBoolean).Add("Made", ECIMType::kCIMTypeDateTime);
   EXPECT_EQ(KeysOf(Parsed("ns:X_Disk.Seen=\"true\",Made=\"20240229120000.000000+060\"")),
             TNames({"Made=20240229120000.000000+060", "Seen=true"}));
 }
@@ -228,7 +229,7 @@ TEST_F(TCIMReferenceTest, PartsReadBeforeAFailureStaySet) {
   TCIMReference disk = Empty();
   EXPECT_STATUS(disk.SetPath("ns:X_Disk.Id=\"5\",Name=\"a"), kZEPStatusInvalidReference);
   EXPECT_EQ(disk.GetPath(), "X_Disk.Id=\"5\"");
-  EXPECT_EQ(disk.GetNamespace(), ns_);
+  EXPECT_EQ(disk.GetNamespace(), fNs);
 
   EXPECT_STATUS(disk.SetPath("ns:X_Disk"), kZEPStatusInvalidOpSequence);
 }
@@ -248,7 +249,7 @@ TEST_F(TCIMReferenceTest, AfterAnUnknownClassThePathCanBeSetAgain) {
 }
 
 TEST_F(TCIMReferenceTest, AnUnknownPropertyMayBeReportedByAnEmptyPointer) {
-  ns_->Class("X_Disk")->fAnswersUnknownByEmpty = true;
+  fNs->Class("X_Disk")->fAnswersUnknownByEmpty = true;
   TLogCapture log;
   EXPECT_STATUS(Parsed("ns:X_Disk.Size=\"5\""), kZEPStatusInvalidReference);
   EXPECT_EQ(log.Entries(), TNames({"[Error] Reference specifies invalid property, property=Size, path=ns:X_Disk.Size=\"5\""}));
@@ -256,7 +257,7 @@ TEST_F(TCIMReferenceTest, AnUnknownPropertyMayBeReportedByAnEmptyPointer) {
 
 TEST_F(TCIMReferenceTest, OtherFailuresOfTheClassLookupPassThroughUnlogged) {
   for (EZEPStatusCode const status : {kZEPStatusConnectionFailed, kZEPStatusInvalidReference, kZEPStatusFail}) {
-    ns_->fCalls.fFailure = status;
+    fNs->fCalls.fFailure = status;
     TLogCapture log;
     EXPECT_STATUS(Parsed("ns:X_Disk.Id=\"5\""), status);
     EXPECT_EQ(log.Entries(), TNames());
@@ -264,7 +265,7 @@ TEST_F(TCIMReferenceTest, OtherFailuresOfTheClassLookupPassThroughUnlogged) {
 }
 
 TEST_F(TCIMReferenceTest, NotFoundOfTheClassLookupBecomesInvalidReference) {
-  ns_->fCalls.fFailure = kZEPStatusNotFound;
+  fNs->fCalls.fFailure = kZEPStatusNotFound;
   TLogCapture log;
   EXPECT_STATUS(Parsed("ns:X_Disk"), kZEPStatusInvalidReference);
   EXPECT_EQ(log.Entries(), TNames({"[Error] Reference specifies invalid class, path=ns:X_Disk"}));
@@ -272,19 +273,19 @@ TEST_F(TCIMReferenceTest, NotFoundOfTheClassLookupBecomesInvalidReference) {
 
 TEST_F(TCIMReferenceTest, OtherFailuresOfThePropertyLookupPassThroughUnlogged) {
   for (EZEPStatusCode const status : {kZEPStatusConnectionFailed, kZEPStatusInvalidReference, kZEPStatusFail}) {
-    ns_->Class("X_Disk")->fCalls.fFailure = status;
+    fNs->Class("X_Disk")->fCalls.fFailure = status;
     TLogCapture log;
     TCIMReference disk = Empty();
     EXPECT_STATUS(disk.SetPath("ns:X_Disk.Id=\"5\""), status);
     EXPECT_EQ(log.Entries(), TNames());
-    EXPECT_EQ(disk.GetClass(), ns_->Class("X_Disk"));
+    EXPECT_EQ(disk.GetClass(), fNs->Class("X_Disk"));
   }
 }
 
 TEST_F(TCIMReferenceTest, FailuresOfReadingAValuePassThroughUnlogged) {
   TCIMValue nullStrings(ECIMType::kCIMTypeString, 4);
-  ns_->Class("X_Disk")->Add("Made", ECIMType::kCIMTypeDateTime).Add("Names", nullStrings.GetType(), nullStrings);
-  ns_->Class("X_Disk")->Add("Nothing", ECIMType::kCIMTypeInvalid);
+  fNs->Class("X_Disk")->Add("Made", ECIMType::kCIMTypeDateTime).Add("Names", nullStrings.GetType(), nullStrings);
+  fNs->Class("X_Disk")->Add("Nothing", ECIMType::kCIMTypeInvalid);
   struct {
     char const* path;
     EZEPStatusCode status;
@@ -304,7 +305,7 @@ TEST_F(TCIMReferenceTest, FailuresOfReadingAValuePassThroughUnlogged) {
 }
 
 TEST_F(TCIMReferenceTest, AConstructorWithABadPathThrows) {
-  EXPECT_STATUS(TCIMReference(ns_, "ns:Y_Disk", TCIMContext()), kZEPStatusInvalidReference);
+  EXPECT_STATUS(TCIMReference(fNs, "ns:Y_Disk", TCIMContext()), kZEPStatusInvalidReference);
   EXPECT_STATUS(TCIMReference(nullptr, "ns:X_Disk", TCIMContext()), kZEPStatusInvalidOpSequence);
 }
 
@@ -314,14 +315,14 @@ TEST_F(TCIMReferenceTest, SetPathNeedsALiveNamespaceAndNeitherClassNorKeys) {
   TCIMReference withExpired(expired, TCIMContext());
   expired.reset();
   TCIMReference withClass = Empty();
-  withClass.SetClass(ns_->Class("X_Disk"));
+  withClass.SetClass(fNs->Class("X_Disk"));
   TCIMReference withKeys = Disk(5);
 
-  ns_->fCalls.fNames.clear();
+  fNs->fCalls.fNames.clear();
   TLogCapture log;
   for (TCIMReference* reference : {&withoutNamespace, &withExpired, &withClass, &withKeys})
     EXPECT_STATUS(reference->SetPath("ns:X_Link"), kZEPStatusInvalidOpSequence);
-  EXPECT_EQ(ns_->fCalls.fNames, TNames());  // nothing was parsed
+  EXPECT_EQ(fNs->fCalls.fNames, TNames());  // nothing was parsed
   EXPECT_EQ(log.Entries(), TNames());
   EXPECT_EQ(withClass.GetPath(), "X_Disk");
   EXPECT_EQ(withKeys.GetPath(), "X_Disk.Id=\"5\"");
@@ -334,12 +335,12 @@ TEST_F(TCIMReferenceTest, ReadsAReferenceAsAKey) {
   EXPECT_EQ(KeysOf(link), TNames({"Disk=X_Disk.Id=\"5\"", "Port=1"}));
   TCIMReference const disk = KeyOf(link, "Disk");
   EXPECT_TRUE(disk == Disk(5));
-  EXPECT_EQ(disk.GetNamespace(), ns_);
-  EXPECT_EQ(KeyOf(link, "Disk").GetReferencedClass(), ns_->Class("X_Disk"));
+  EXPECT_EQ(disk.GetNamespace(), fNs);
+  EXPECT_EQ(KeyOf(link, "Disk").GetReferencedClass(), fNs->Class("X_Disk"));
 }
 
 TEST_F(TCIMReferenceTest, ReadsReferencesWithinReferences) {
-  ns_->Add("X_Rack").Add("Link", ECIMType::kCIMTypeReference).Add("Row", ECIMType::kCIMTypeUint8);
+  fNs->Add("X_Rack").Add("Link", ECIMType::kCIMTypeReference).Add("Row", ECIMType::kCIMTypeUint8);
   TCIMReference const rack =
       Parsed("ns:X_Rack.Link=\"a:X_Link.Disk=\"b:X_Disk.Id=\"5\",Name=\"x\\\"y\"\",Port=\"1\"\",Row=\"2\"");
   EXPECT_EQ(KeysOf(rack), TNames({R"(Link=X_Link.Disk="X_Disk.Id="5",Name="x\"y"",Port="1")", "Row=2"}));
@@ -347,13 +348,13 @@ TEST_F(TCIMReferenceTest, ReadsReferencesWithinReferences) {
 
 TEST_F(TCIMReferenceTest, AReferenceKeyMayHaveADefaultThatIsNotNull) {
   TCIMReference disk = Disk(1);
-  ns_->Add("X_Start").Add("Disk", ECIMType::kCIMTypeReference, TCIMValue(disk));
+  fNs->Add("X_Start").Add("Disk", ECIMType::kCIMTypeReference, TCIMValue(disk));
   EXPECT_EQ(KeysOf(Parsed("ns:X_Start.Disk=\"ns:X_Disk.Id=\"5\"\"")), TNames({"Disk=X_Disk.Id=\"5\""}));
 }
 
 // The default value, not the declared type, marks a key as a reference. Without one the value is read as escaped text.
 TEST_F(TCIMReferenceTest, AReferenceTypeWithoutAReferenceDefaultIsReadAsEscapedText) {
-  ns_->Add("X_Loose").Add("Disk", ECIMType::kCIMTypeReference, TCIMValue());
+  fNs->Add("X_Loose").Add("Disk", ECIMType::kCIMTypeReference, TCIMValue());
   TCIMReference const loose = Parsed("ns:X_Loose.Disk=\"ns:X_Disk.Id=\\\"5\\\"\"");
   EXPECT_EQ(KeysOf(loose), TNames({"Disk=X_Disk.Id=\"5\""}));
 
@@ -378,10 +379,10 @@ TEST_F(TCIMReferenceTest, ANestedPathNeedsAPrefixAndKeys) {
   };
   for (auto const& row : kRows) {
     SCOPED_TRACE(row.path);
-    ns_->fCalls.fNames.clear();
+    fNs->fCalls.fNames.clear();
     TLogCapture log;
     EXPECT_STATUS(Parsed(row.path), kZEPStatusInvalidReference);
-    EXPECT_EQ(ns_->fCalls.fNames, TNames({"X_Link", row.className}));
+    EXPECT_EQ(fNs->fCalls.fNames, TNames({"X_Link", row.className}));
     EXPECT_EQ(log.Entries(), TNames({std::string("[Error] Reference specifies invalid class, path=") + row.path}));
   }
 }
@@ -493,7 +494,7 @@ TEST_F(TCIMReferenceTest, PrintsAReferenceKeyRaw) {
 TEST_F(TCIMReferenceTest, PrintsAnArrayOfStringsEscaped) {
   std::vector<TCIMValue> const names = {TCIMValue("a\"b"), TCIMValue("c")};
   TCIMValue const value(ECIMType::kCIMTypeString, 0, names);
-  ns_->Class("X_Disk")->Add("Names", value.GetType(), value);
+  fNs->Class("X_Disk")->Add("Names", value.GetType(), value);
   TCIMReference disk = Empty();
   disk.SetClassName("X_Disk");
   disk.AddKeyValue("Names", value);
@@ -519,7 +520,7 @@ TEST_F(TCIMReferenceTest, PrintingWithoutAClassIsAFailedAssertion) {
 
 TEST_F(TCIMReferenceTest, ANewReferenceHasOnlyItsNamespace) {
   TCIMReference const reference = Empty();
-  EXPECT_EQ(reference.GetNamespace(), ns_);
+  EXPECT_EQ(reference.GetNamespace(), fNs);
   EXPECT_FALSE(reference.GetClass());
   EXPECT_EQ(KeysOf(reference), TNames());
   EXPECT_EQ(reference.GetNameSpaceName(), "");
@@ -556,38 +557,38 @@ TEST_F(TCIMReferenceTest, NamespaceNameIsALabelThatOtherOperationsIgnore) {
 
 TEST_F(TCIMReferenceTest, SetClassNameLooksTheClassUpWithTheContextOfTheReference) {
   TCIMContext const context = {{"who", TCIMValue("me")}};
-  TCIMReference disk(ns_, context);
+  TCIMReference disk(fNs, context);
   disk.SetClassName("X_Disk");
-  EXPECT_EQ(disk.GetClass(), ns_->Class("X_Disk"));
-  EXPECT_EQ(ns_->fCalls.fContexts, (std::vector<TCIMContext>{context}));
+  EXPECT_EQ(disk.GetClass(), fNs->Class("X_Disk"));
+  EXPECT_EQ(fNs->fCalls.fContexts, (std::vector<TCIMContext>{context}));
 }
 
 TEST_F(TCIMReferenceTest, ParsingLooksEveryClassUpWithTheContextOfTheReference) {
   TCIMContext const context = {{"who", TCIMValue("me")}};
-  TCIMReference const link(ns_, "ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\"\"", context);
-  EXPECT_EQ(ns_->fCalls.fNames, TNames({"X_Link", "X_Disk"}));
-  EXPECT_EQ(ns_->fCalls.fContexts, (std::vector<TCIMContext>{context, context}));
+  TCIMReference const link(fNs, "ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\"\"", context);
+  EXPECT_EQ(fNs->fCalls.fNames, TNames({"X_Link", "X_Disk"}));
+  EXPECT_EQ(fNs->fCalls.fContexts, (std::vector<TCIMContext>{context, context}));
 }
 
 TEST_F(TCIMReferenceTest, SetContextReplacesTheCompleteContext) {
-  TCIMReference disk(ns_, TCIMContext{{"who", TCIMValue("me")}});
+  TCIMReference disk(fNs, TCIMContext{{"who", TCIMValue("me")}});
   disk.SetContext(TCIMContext{{"why", TCIMValue(1u)}});
   disk.SetClassName("X_Disk");
-  EXPECT_EQ(ns_->fCalls.fContexts, (std::vector<TCIMContext>{{{"why", TCIMValue(1u)}}}));
+  EXPECT_EQ(fNs->fCalls.fContexts, (std::vector<TCIMContext>{{{"why", TCIMValue(1u)}}}));
 }
 
 TEST_F(TCIMReferenceTest, OtherCallsPassAnEmptyContext) {
-  ns_->fInstance = boost::make_shared<TFakeInstance>();
-  TCIMReference disk(ns_, "ns:X_Disk.Id=\"5\"", TCIMContext{{"who", TCIMValue("me")}});
+  fNs->fInstance = boost::make_shared<TFakeInstance>();
+  TCIMReference disk(fNs, "ns:X_Disk.Id=\"5\"", TCIMContext{{"who", TCIMValue("me")}});
   disk.AddKeyValue("Name", TCIMValue("a"));
   disk.GetPath();
   disk.GetCIMElement(false);
 
-  auto const cls = ns_->Class("X_Disk");
+  auto const cls = fNs->Class("X_Disk");
   std::vector<TCIMContext> contexts = cls->fCalls.fContexts;
   for (auto const& decl : cls->fDecls)
     contexts.insert(contexts.end(), decl.second->fCalls.fContexts.begin(), decl.second->fCalls.fContexts.end());
-  contexts.insert(contexts.end(), ns_->fLookedUpContexts.begin(), ns_->fLookedUpContexts.end());
+  contexts.insert(contexts.end(), fNs->fLookedUpContexts.begin(), fNs->fLookedUpContexts.end());
   EXPECT_GE(contexts.size(), 8u);
   for (TCIMContext const& context : contexts) EXPECT_TRUE(context.empty());
 }
@@ -596,7 +597,7 @@ TEST_F(TCIMReferenceTest, FailuresOfTheLookupPassThroughSetClassName) {
   TLogCapture log;
   TCIMReference disk = Empty();
   EXPECT_STATUS(disk.SetClassName("Y_Disk"), kZEPStatusNotFound);
-  ns_->fCalls.fFailure = kZEPStatusConnectionFailed;
+  fNs->fCalls.fFailure = kZEPStatusConnectionFailed;
   EXPECT_STATUS(disk.SetClassName("X_Disk"), kZEPStatusConnectionFailed);
   EXPECT_EQ(log.Entries(), TNames());
   EXPECT_FALSE(disk.GetClass());
@@ -622,7 +623,7 @@ TEST_F(TCIMReferenceTest, TheClassCanBeReplacedWhileThereAreNoKeys) {
 
 TEST_F(TCIMReferenceTest, TheClassCannotBeChangedOnceThereAreKeys) {
   TCIMReference disk = Disk(5);
-  EXPECT_STATUS(disk.SetClass(ns_->Class("X_Link")), kZEPStatusInvalidOpSequence);
+  EXPECT_STATUS(disk.SetClass(fNs->Class("X_Link")), kZEPStatusInvalidOpSequence);
   EXPECT_STATUS(disk.SetClass(disk.GetClass()), kZEPStatusInvalidOpSequence);
   EXPECT_STATUS(disk.SetClassName("X_Link"), kZEPStatusInvalidOpSequence);
   EXPECT_STATUS(disk.SetClassName("Y_Link"), kZEPStatusNotFound);  // the class is looked up first
@@ -630,20 +631,20 @@ TEST_F(TCIMReferenceTest, TheClassCannotBeChangedOnceThereAreKeys) {
 }
 
 TEST_F(TCIMReferenceTest, ClearRemovesNamespaceClassKeysAndElement) {
-  ns_->fInstance = boost::make_shared<TFakeInstance>();
-  TCIMReference disk(ns_, "ns:X_Disk.Id=\"5\"", TCIMContext{{"who", TCIMValue("me")}});
+  fNs->fInstance = boost::make_shared<TFakeInstance>();
+  TCIMReference disk(fNs, "ns:X_Disk.Id=\"5\"", TCIMContext{{"who", TCIMValue("me")}});
   disk.GetCIMElement(false);
-  EXPECT_EQ(ns_->fInstance.use_count(), 2);
+  EXPECT_EQ(fNs->fInstance.use_count(), 2);
   disk.Clear();
   EXPECT_FALSE(disk.GetNamespace());
   EXPECT_FALSE(disk.GetClass());
   EXPECT_EQ(KeysOf(disk), TNames());
-  EXPECT_EQ(ns_->fInstance.use_count(), 1);
+  EXPECT_EQ(fNs->fInstance.use_count(), 1);
 
-  ns_->fCalls.fContexts.clear();
-  disk.SetNamespace(ns_);
+  fNs->fCalls.fContexts.clear();
+  disk.SetNamespace(fNs);
   disk.SetPath("ns:X_Disk");
-  EXPECT_EQ(ns_->fCalls.fContexts, (std::vector<TCIMContext>{{{"who", TCIMValue("me")}}}));  // the context was not removed
+  EXPECT_EQ(fNs->fCalls.fContexts, (std::vector<TCIMContext>{{{"who", TCIMValue("me")}}}));  // the context was not removed
 }
 
 // ---- Adding keys ----
@@ -658,9 +659,9 @@ TEST_F(TCIMReferenceTest, AddKeyValueOfAnUnknownPropertyThrowsNotFoundUnlogged) 
   disk.SetClassName("X_Disk");
   TLogCapture log;
   EXPECT_STATUS(disk.AddKeyValue("Size", TCIMValue(5u)), kZEPStatusNotFound);
-  ns_->Class("X_Disk")->fAnswersUnknownByEmpty = true;
+  fNs->Class("X_Disk")->fAnswersUnknownByEmpty = true;
   EXPECT_STATUS(disk.AddKeyValue("Size", TCIMValue(5u)), kZEPStatusNotFound);
-  ns_->Class("X_Disk")->fCalls.fFailure = kZEPStatusConnectionFailed;
+  fNs->Class("X_Disk")->fCalls.fFailure = kZEPStatusConnectionFailed;
   EXPECT_STATUS(disk.AddKeyValue("Id", TCIMValue(5u)), kZEPStatusConnectionFailed);
   EXPECT_EQ(log.Entries(), TNames());
   EXPECT_EQ(disk.GetPath(), "X_Disk");
@@ -712,7 +713,7 @@ TEST_F(TCIMReferenceTest, FirstKeyWins) {
 }
 
 TEST_F(TCIMReferenceTest, EnumeratesKeysInByteOrderUntilFalse) {
-  ns_->Class("X_Disk")->Add("a", ECIMType::kCIMTypeUint32).Add("B", ECIMType::kCIMTypeUint32);
+  fNs->Class("X_Disk")->Add("a", ECIMType::kCIMTypeUint32).Add("B", ECIMType::kCIMTypeUint32);
   TCIMReference disk = Empty();
   disk.SetClassName("X_Disk");
   for (char const* name : {"a", "Id", "B"}) disk.AddKeyValue(name, TCIMValue(1u));
@@ -727,44 +728,44 @@ TEST_F(TCIMReferenceTest, EnumeratesKeysInByteOrderUntilFalse) {
 
 TEST_F(TCIMReferenceTest, WithoutKeysTheElementIsTheClass) {
   TCIMReference const disk = Parsed("ns:X_Disk");
-  EXPECT_EQ(disk.GetCIMElement(false), ns_->Class("X_Disk"));
-  EXPECT_EQ(disk.GetCIMElement(true), ns_->Class("X_Disk"));
-  EXPECT_TRUE(ns_->fLookedUp.empty());
+  EXPECT_EQ(disk.GetCIMElement(false), fNs->Class("X_Disk"));
+  EXPECT_EQ(disk.GetCIMElement(true), fNs->Class("X_Disk"));
+  EXPECT_TRUE(fNs->fLookedUp.empty());
   EXPECT_FALSE(Empty().GetCIMElement(false));
 }
 
 TEST_F(TCIMReferenceTest, ClassOnlyReturnsTheClassEvenWithKeys) {
-  EXPECT_EQ(Disk(5).GetCIMElement(true), ns_->Class("X_Disk"));
-  EXPECT_TRUE(ns_->fLookedUp.empty());
+  EXPECT_EQ(Disk(5).GetCIMElement(true), fNs->Class("X_Disk"));
+  EXPECT_TRUE(fNs->fLookedUp.empty());
 }
 
 TEST_F(TCIMReferenceTest, WithKeysTheInstanceIsLookedUpInTheNamespaceOfTheClass) {
-  ns_->fInstance = boost::make_shared<TFakeInstance>();
+  fNs->fInstance = boost::make_shared<TFakeInstance>();
   TCIMReference disk = Disk(5);
   disk.SetNamespace(boost::make_shared<TFakeNamespace>());  // not the one used
-  EXPECT_EQ(disk.GetCIMElement(false), ns_->fInstance);
-  EXPECT_EQ(ns_->fLookedUp, (std::vector<TCIMReference const*>{&disk}));
+  EXPECT_EQ(disk.GetCIMElement(false), fNs->fInstance);
+  EXPECT_EQ(fNs->fLookedUp, (std::vector<TCIMReference const*>{&disk}));
 }
 
 TEST_F(TCIMReferenceTest, TheElementIsLookedUpOnceAndNeverAgain) {
-  ns_->fInstance = boost::make_shared<TFakeInstance>();
-  auto const first = ns_->fInstance;
+  fNs->fInstance = boost::make_shared<TFakeInstance>();
+  auto const first = fNs->fInstance;
   TCIMReference disk = Disk(5);
   EXPECT_EQ(disk.GetCIMElement(false), first);
 
-  ns_->fInstance = boost::make_shared<TFakeInstance>();
+  fNs->fInstance = boost::make_shared<TFakeInstance>();
   disk.AddKeyValue("Name", TCIMValue("a"));
   EXPECT_EQ(disk.GetCIMElement(false), first);
-  EXPECT_EQ(ns_->fLookedUp.size(), 1u);
+  EXPECT_EQ(fNs->fLookedUp.size(), 1u);
 }
 
 TEST_F(TCIMReferenceTest, AFailureOfTheLookupPassesThroughAndIsNotRemembered) {
   TCIMReference const disk = Disk(5);
-  ns_->fInstanceFailure = kZEPStatusAccessDenied;
+  fNs->fInstanceFailure = kZEPStatusAccessDenied;
   EXPECT_STATUS(disk.GetCIMElement(false), kZEPStatusAccessDenied);
-  ns_->fInstanceFailure.reset();
-  ns_->fInstance = boost::make_shared<TFakeInstance>();
-  EXPECT_EQ(disk.GetCIMElement(false), ns_->fInstance);
+  fNs->fInstanceFailure.reset();
+  fNs->fInstance = boost::make_shared<TFakeInstance>();
+  EXPECT_EQ(disk.GetCIMElement(false), fNs->fInstance);
 }
 
 TEST_F(TCIMReferenceTest, AnUnknownInstanceThrowsNotFoundAndIsLookedUpAgain) {
@@ -772,9 +773,9 @@ TEST_F(TCIMReferenceTest, AnUnknownInstanceThrowsNotFoundAndIsLookedUpAgain) {
   TLogCapture log;
   EXPECT_STATUS(disk.GetCIMElement(false), kZEPStatusNotFound);
   EXPECT_EQ(log.Entries(), TNames());
-  ns_->fInstance = boost::make_shared<TFakeInstance>();
-  EXPECT_EQ(disk.GetCIMElement(false), ns_->fInstance);
-  EXPECT_EQ(ns_->fLookedUp.size(), 2u);
+  fNs->fInstance = boost::make_shared<TFakeInstance>();
+  EXPECT_EQ(disk.GetCIMElement(false), fNs->fInstance);
+  EXPECT_EQ(fNs->fLookedUp.size(), 2u);
 }
 
 TEST_F(TCIMReferenceTest, AClassWhoseNamespaceWasDestroyedThrowsBadWeakPtr) {
@@ -789,46 +790,46 @@ TEST_F(TCIMReferenceTest, AClassWhoseNamespaceWasDestroyedThrowsBadWeakPtr) {
 // ---- Copying and moving ----
 
 TEST_F(TCIMReferenceTest, ACopyIsDeepAndBoundToItself) {
-  ns_->fInstance = boost::make_shared<TFakeInstance>();
-  TCIMReference disk(ns_, "ns:X_Disk.Id=\"5\"", TCIMContext{{"who", TCIMValue("me")}});
+  fNs->fInstance = boost::make_shared<TFakeInstance>();
+  TCIMReference disk(fNs, "ns:X_Disk.Id=\"5\"", TCIMContext{{"who", TCIMValue("me")}});
   disk.SetNameSpaceName("label");
   TCIMReference copy = disk;
   copy.AddKeyValue("Name", TCIMValue("a"));
   EXPECT_EQ(disk.GetPath(), "X_Disk.Id=\"5\"");
   EXPECT_EQ(copy.GetPath(), "X_Disk.Id=\"5\",Name=\"a\"");
   EXPECT_EQ(copy.GetNameSpaceName(), "label");
-  EXPECT_EQ(copy.GetNamespace(), ns_);
+  EXPECT_EQ(copy.GetNamespace(), fNs);
   EXPECT_NE(copy.GetBody(), disk.GetBody());
 
   copy.GetCIMElement(false);
-  EXPECT_EQ(ns_->fLookedUp, (std::vector<TCIMReference const*>{&copy}));
+  EXPECT_EQ(fNs->fLookedUp, (std::vector<TCIMReference const*>{&copy}));
 }
 
 TEST_F(TCIMReferenceTest, ACopyHasTheContext) {
   TCIMContext const context = {{"who", TCIMValue("me")}};
-  TCIMReference const original(ns_, context);
+  TCIMReference const original(fNs, context);
   TCIMReference copy = original;
   copy.SetClassName("X_Disk");
-  EXPECT_EQ(ns_->fCalls.fContexts, (std::vector<TCIMContext>{context}));
+  EXPECT_EQ(fNs->fCalls.fContexts, (std::vector<TCIMContext>{context}));
 }
 
 TEST_F(TCIMReferenceTest, ACopyHasTheResolvedElement) {
-  ns_->fInstance = boost::make_shared<TFakeInstance>();
+  fNs->fInstance = boost::make_shared<TFakeInstance>();
   TCIMReference const disk = Disk(5);
   disk.GetCIMElement(false);
   TCIMReference const copy = disk;
-  EXPECT_EQ(copy.GetCIMElement(false), ns_->fInstance);
-  EXPECT_EQ(ns_->fLookedUp, (std::vector<TCIMReference const*>{&disk}));
+  EXPECT_EQ(copy.GetCIMElement(false), fNs->fInstance);
+  EXPECT_EQ(fNs->fLookedUp, (std::vector<TCIMReference const*>{&disk}));
 }
 
 TEST_F(TCIMReferenceTest, AssignmentReplacesEverythingAndBindsToTheTarget) {
-  ns_->fInstance = boost::make_shared<TFakeInstance>();
+  fNs->fInstance = boost::make_shared<TFakeInstance>();
   TCIMReference const disk = Disk(5);
   TCIMReference target = Parsed("ns:X_Link.Port=\"1\"");
   target = disk;
   EXPECT_TRUE(target == disk);
   target.GetCIMElement(false);
-  EXPECT_EQ(ns_->fLookedUp, (std::vector<TCIMReference const*>{&target}));
+  EXPECT_EQ(fNs->fLookedUp, (std::vector<TCIMReference const*>{&target}));
 }
 
 TEST_F(TCIMReferenceTest, SelfAssignmentChangesNothing) {
@@ -841,7 +842,7 @@ TEST_F(TCIMReferenceTest, SelfAssignmentChangesNothing) {
 }
 
 TEST_F(TCIMReferenceTest, AMovedBodyIsBoundToItsNewHandle) {
-  ns_->fInstance = boost::make_shared<TFakeInstance>();
+  fNs->fInstance = boost::make_shared<TFakeInstance>();
   TCIMReference disk = Disk(5);
   TCIMReferenceImpl const* const body = disk.GetBody();
   TCIMReference moved = std::move(disk);
@@ -851,7 +852,7 @@ TEST_F(TCIMReferenceTest, AMovedBodyIsBoundToItsNewHandle) {
   EXPECT_EQ(assigned.GetBody(), body);
   EXPECT_EQ(assigned.GetPath(), "X_Disk.Id=\"5\"");
   assigned.GetCIMElement(false);
-  EXPECT_EQ(ns_->fLookedUp, (std::vector<TCIMReference const*>{&assigned}));
+  EXPECT_EQ(fNs->fLookedUp, (std::vector<TCIMReference const*>{&assigned}));
 }
 
 TEST_F(TCIMReferenceTest, AVectorOfReferencesGrowsWithoutCopying) {
@@ -892,7 +893,7 @@ TEST_F(TCIMReferenceTest, EqualMeansTheSameClassObjectAndEqualKeys) {
 }
 
 TEST_F(TCIMReferenceTest, EqualityIgnoresTheOtherParts) {
-  TCIMReference disk(ns_, "ns:X_Disk.Id=\"5\"", TCIMContext{{"who", TCIMValue("me")}});
+  TCIMReference disk(fNs, "ns:X_Disk.Id=\"5\"", TCIMContext{{"who", TCIMValue("me")}});
   disk.SetNameSpaceName("label");
   disk.SetNamespace(nullptr);
   EXPECT_TRUE(disk == Disk(5));
@@ -919,7 +920,7 @@ TEST_F(TCIMReferenceTest, WithinAClassTheOrderIsThatOfTheKeys) {
 }
 
 TEST_F(TCIMReferenceTest, BetweenClassesTheOrderIsThatOfTheClassObjects) {
-  bool const disksFirst = ns_->Class("X_Disk").owner_before(ns_->Class("X_Link"));
+  bool const disksFirst = fNs->Class("X_Disk").owner_before(fNs->Class("X_Link"));
   for (char const* disk : {"ns:X_Disk", "ns:X_Disk.Id=\"5\""})
     for (char const* link : {"ns:X_Link", "ns:X_Link.Port=\"5\""}) {
       EXPECT_EQ(Parsed(disk) < Parsed(link), disksFirst);
@@ -930,7 +931,7 @@ TEST_F(TCIMReferenceTest, BetweenClassesTheOrderIsThatOfTheClassObjects) {
 TEST_F(TCIMReferenceTest, ComparingArraysOfKeysThrows) {
   TCIMValue const one(ECIMType::kCIMTypeUint8, 0, {TCIMValue(static_cast<unsigned char>(1))});
   TCIMValue const two(ECIMType::kCIMTypeUint8, 0, {TCIMValue(static_cast<unsigned char>(2))});
-  ns_->Class("X_Disk")->Add("Bytes", one.GetType(), one);
+  fNs->Class("X_Disk")->Add("Bytes", one.GetType(), one);
   TCIMReference left = Parsed("ns:X_Disk");
   TCIMReference right = left;
   left.AddKeyValue("Bytes", one);
@@ -972,7 +973,7 @@ TEST_F(TCIMReferenceTest, ValuesCanHoldReferences) {
   TCIMReference disk = Disk(5);
   TCIMValue const value(disk);
   EXPECT_TRUE(value.IsReference());
-  EXPECT_EQ(value.GetReferencedClass(), ns_->Class("X_Disk"));
+  EXPECT_EQ(value.GetReferencedClass(), fNs->Class("X_Disk"));
   EXPECT_EQ(value.ToString(16), "X_Disk.Id=\"5\"");
   TCIMReference const out = value;
   EXPECT_TRUE(out == disk);
@@ -982,9 +983,9 @@ TEST_F(TCIMReferenceTest, ValuesCanHoldReferences) {
 
 TEST_F(TCIMReferenceTest, AReferenceIsReadFromTheTextOfAValue) {
   std::string text = "ns:X_Disk.Id=\"5\"";
-  TCIMValue const value(ECIMType::kCIMTypeReference, text, ns_);
+  TCIMValue const value(ECIMType::kCIMTypeReference, text, fNs);
   EXPECT_EQ(value.ToString(10), "X_Disk.Id=\"5\"");
-  EXPECT_EQ(value.GetReferencedClass(), ns_->Class("X_Disk"));
+  EXPECT_EQ(value.GetReferencedClass(), fNs->Class("X_Disk"));
 }
 
 // ---- Against a namespace in memory ----
@@ -992,18 +993,18 @@ TEST_F(TCIMReferenceTest, AReferenceIsReadFromTheTextOfAValue) {
 class TCIMReferenceInMemoryTest : public testing::Test {
 protected:
   TCIMReferenceInMemoryTest() {
-    ns_->DefineClass("X_Disk").Key("Id", "uint32").Key("Name", "string").Property("Size", "uint64");
-    ns_->DefineClass("X_Link").Association().KeyReference("Disk", "X_Disk").Key("Port", "uint8");
+    fNs->DefineClass("X_Disk").Key("Id", "uint32").Key("Name", "string").Property("Size", "uint64");
+    fNs->DefineClass("X_Link").Association().KeyReference("Disk", "X_Disk").Key("Port", "uint8");
   }
 
-  TCIMReference Parsed(std::string const& path) const { return TCIMReference(ns_, path, TCIMContext()); }
+  TCIMReference Parsed(std::string const& path) const { return TCIMReference(fNs, path, TCIMContext()); }
 
-  boost::shared_ptr<TMemoryNamespace> const ns_ = boost::make_shared<TMemoryNamespace>("root/storage");
+  boost::shared_ptr<TMemoryNamespace> const fNs = boost::make_shared<TMemoryNamespace>("root/storage");
 };
 
 TEST_F(TCIMReferenceInMemoryTest, APathResolvesToItsInstance) {
-  auto const sda = ns_->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "s\"d\\a"}});
-  auto const sdb = ns_->AddInstance("X_Disk", {{"Id", 6u}, {"Name", "sdb"}});
+  auto const sda = fNs->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "s\"d\\a"}});
+  auto const sdb = fNs->AddInstance("X_Disk", {{"Id", 6u}, {"Name", "sdb"}});
   EXPECT_EQ(Parsed("ns:X_Disk.Id=\"5\",Name=\"s\\\"d\\\\a\"").GetCIMElement(false), sda);
   EXPECT_EQ(Parsed("ns:X_Disk.Name=\"sdb\",Id=\"6\"").GetCIMElement(false), sdb);
   EXPECT_STATUS(Parsed("ns:X_Disk.Name=\"sdb\",Id=\"7\"").GetCIMElement(false), kZEPStatusNotFound);
@@ -1011,7 +1012,7 @@ TEST_F(TCIMReferenceInMemoryTest, APathResolvesToItsInstance) {
 }
 
 TEST_F(TCIMReferenceInMemoryTest, ThePathOfAnInstanceResolvesToTheInstance) {
-  auto const disk = ns_->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "a\",\\b=c.d:e"}});
+  auto const disk = fNs->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "a\",\\b=c.d:e"}});
   TCIMReference const path = disk->GetPath(TCIMContext());
   EXPECT_EQ(path.GetCIMElement(false), disk);
   EXPECT_TRUE(Parsed("ns:" + path.GetPath()) == path);
@@ -1019,8 +1020,8 @@ TEST_F(TCIMReferenceInMemoryTest, ThePathOfAnInstanceResolvesToTheInstance) {
 }
 
 TEST_F(TCIMReferenceInMemoryTest, AReferenceKeyResolvesToItsInstance) {
-  auto const disk = ns_->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "sda"}});
-  auto const link = ns_->AddInstance("X_Link", {{"Disk", disk->GetReference()}, {"Port", 1}});
+  auto const disk = fNs->AddInstance("X_Disk", {{"Id", 5u}, {"Name", "sda"}});
+  auto const link = fNs->AddInstance("X_Link", {{"Disk", disk->GetReference()}, {"Port", 1}});
   TCIMReference const path = Parsed("ns:X_Link.Disk=\"ns:X_Disk.Id=\"5\",Name=\"sda\"\",Port=\"1\"");
   EXPECT_EQ(path.GetCIMElement(false), link);
   EXPECT_EQ(path.GetPath(), "X_Link.Disk=\"X_Disk.Id=\"5\",Name=\"sda\"\",Port=\"1\"");
@@ -1035,10 +1036,10 @@ TEST_F(TCIMReferenceInMemoryTest, UnknownNamesAreInvalid) {
 
 // A class that is still being described returns an empty pointer for an unknown name.
 TEST_F(TCIMReferenceInMemoryTest, UnknownNamesAreInvalidWhileTheClassIsBeingDescribed) {
-  auto const cls = ns_->GetClass("X_Disk", TCIMContext());
+  auto const cls = fNs->GetClass("X_Disk", TCIMContext());
   cls->BeginDeclarations(TCIMContext());
   EXPECT_STATUS(Parsed("ns:X_Disk.Serial=\"5\""), kZEPStatusInvalidReference);
-  TCIMReference disk(ns_, TCIMContext());
+  TCIMReference disk(fNs, TCIMContext());
   disk.SetClass(cls);
   EXPECT_STATUS(disk.AddKeyValue("Serial", TCIMValue(5u)), kZEPStatusNotFound);
 }

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TCIMSchemaHelper.h"
 
 #include "Fakes.h"
@@ -506,48 +507,48 @@ class TCIMSchemaHelperEsxiTest : public testing::Test {
 protected:
   // An instance with one property.
   void Add(std::string const& className, std::string const& property, TCIMValue const& value) {
-    auto& cls = classes_.count(className) ? *ns_->Class(className) : ns_->Add(className);
-    classes_.insert(className);
+    auto& cls = fClasses.count(className) ? *fNs->Class(className) : fNs->Add(className);
+    fClasses.insert(className);
     cls.AddInstance()->Add(property, value);
   }
 
-  std::string SerialNumber() { return TCIMSchemaHelper::GetSerialNumber_vmwesxi(ns_, TCIMContext()); }
+  std::string SerialNumber() { return TCIMSchemaHelper::GetSerialNumber_vmwesxi(fNs, TCIMContext()); }
 
-  boost::shared_ptr<TFakeNamespace> const ns_ = boost::make_shared<TFakeNamespace>();
+  boost::shared_ptr<TFakeNamespace> const fNs = boost::make_shared<TFakeNamespace>();
 
 private:
-  std::set<std::string> classes_;
+  std::set<std::string> fClasses;
 };
 
 TEST_F(TCIMSchemaHelperEsxiTest, MissingDataIsUnknown) {
   for (bool const answersByEmpty : {false, true}) {
-    ns_->fAnswersUnknownByEmpty = answersByEmpty;
-    EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Unknown");
-    EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(ns_), "Unknown");
-    EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "Unknown");
+    fNs->fAnswersUnknownByEmpty = answersByEmpty;
+    EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(fNs), "Unknown");
+    EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(fNs), "Unknown");
+    EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(fNs), "Unknown");
   }
-  ns_->Add("CIM_PhysicalElement");
-  ns_->Add("VMware_HypervisorSoftwareIdentity");
-  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Unknown");
-  EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(ns_), "Unknown");
-  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "Unknown");
+  fNs->Add("CIM_PhysicalElement");
+  fNs->Add("VMware_HypervisorSoftwareIdentity");
+  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(fNs), "Unknown");
+  EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(fNs), "Unknown");
+  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(fNs), "Unknown");
 }
 
 TEST_F(TCIMSchemaHelperEsxiTest, ValuesThatCannotBeReadAreSkipped) {
-  auto& elements = ns_->Add("CIM_PhysicalElement");
+  auto& elements = fNs->Add("CIM_PhysicalElement");
   elements.AddInstance()->Add("Model", TCIMValue("Server X1-[1234ABC]-"));
   elements.AddInstance();
   elements.AddInstance()->Add("Model", NullOf(ECIMType::kCIMTypeString));
   elements.AddInstance()->Add("Model", TCIMValue(5u));
   elements.AddInstance()->Add("Model", Strings({"Server X2-[5678DEF]-"}));
-  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Server X1-[1234ABC]-");
+  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(fNs), "Server X1-[1234ABC]-");
 }
 
 TEST_F(TCIMSchemaHelperEsxiTest, TheLastModelWithBothBracketsIsTheProductName) {
   for (char const* model : {"Server X1-[1234ABC]-", "Chassis", "Server X2-[5678DEF]-", "Server X3-[9999", "Server X4]-", "-["})
     Add("CIM_PhysicalElement", "Model", TCIMValue(model));
-  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Server X2-[5678DEF]-");
-  EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(ns_), "5678DEF");
+  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(fNs), "Server X2-[5678DEF]-");
+  EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(fNs), "5678DEF");
 }
 
 TEST_F(TCIMSchemaHelperEsxiTest, TheMTMIsTheTextBetweenTheFirstBrackets) {
@@ -578,12 +579,12 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheLastLargeBuildNumberIsTheOperatingSystem) {
   Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue("23456"));
   Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", NullOf(ECIMType::kCIMTypeString));
   Add("VMware_HypervisorSoftwareIdentity", "Other", TCIMValue("34567"));
-  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "23456");
+  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(fNs), "23456");
 }
 
 TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberMayBeAnInteger) {
   Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue(20000000000ul));
-  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "20000000000");
+  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(fNs), "20000000000");
 }
 
 TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberOfAnotherTypeIsSkipped) {
@@ -591,14 +592,14 @@ TEST_F(TCIMSchemaHelperEsxiTest, ALargeBuildNumberOfAnotherTypeIsSkipped) {
   Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", Strings({"23456"}));
   Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue(TCIMChar16(std::string("x"))));
   Add("VMware_HypervisorSoftwareIdentity", "LargeBuildNumber", TCIMValue(TCIMDateTime()));
-  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), "12345");
+  EXPECT_EQ(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(fNs), "12345");
 }
 
 TEST_F(TCIMSchemaHelperEsxiTest, WithoutChassisTheSerialNumberIsNotFound) {
   EXPECT_STATUS(SerialNumber(), kZEPStatusNotFound);
   Add("OMC_UnitaryComputerSystem", "OtherIdentifyingInfo", Strings({"SN:KQ1234A"}));
   EXPECT_STATUS(SerialNumber(), kZEPStatusNotFound);
-  ns_->Add("OMC_Chassis");
+  fNs->Add("OMC_Chassis");
   EXPECT_STATUS(SerialNumber(), kZEPStatusNotFound);
 }
 
@@ -667,29 +668,29 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheLastSystemWithIdentifyingInfoCounts) {
 }
 
 TEST_F(TCIMSchemaHelperEsxiTest, OtherFailuresOfTheNamespacePassThrough) {
-  ns_->fCalls.fFailure = kZEPStatusConnectionFailed;
-  EXPECT_STATUS(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), kZEPStatusConnectionFailed);
-  EXPECT_STATUS(TCIMSchemaHelper::GetMTM_vmwesxi(ns_), kZEPStatusConnectionFailed);
-  EXPECT_STATUS(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_), kZEPStatusConnectionFailed);
+  fNs->fCalls.fFailure = kZEPStatusConnectionFailed;
+  EXPECT_STATUS(TCIMSchemaHelper::GetSystemProductName_vmwesxi(fNs), kZEPStatusConnectionFailed);
+  EXPECT_STATUS(TCIMSchemaHelper::GetMTM_vmwesxi(fNs), kZEPStatusConnectionFailed);
+  EXPECT_STATUS(TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(fNs), kZEPStatusConnectionFailed);
   EXPECT_STATUS(SerialNumber(), kZEPStatusConnectionFailed);
 
-  ns_->fCalls.fFailure.reset();
-  ns_->Add("CIM_PhysicalElement").fEnumerationFailure = kZEPStatusAccessDenied;
-  EXPECT_STATUS(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), kZEPStatusAccessDenied);
-  ns_->Add("CIM_PhysicalElement").fEnumerationFailure = kZEPStatusNotFound;
-  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_), "Unknown");
+  fNs->fCalls.fFailure.reset();
+  fNs->Add("CIM_PhysicalElement").fEnumerationFailure = kZEPStatusAccessDenied;
+  EXPECT_STATUS(TCIMSchemaHelper::GetSystemProductName_vmwesxi(fNs), kZEPStatusAccessDenied);
+  fNs->Add("CIM_PhysicalElement").fEnumerationFailure = kZEPStatusNotFound;
+  EXPECT_EQ(TCIMSchemaHelper::GetSystemProductName_vmwesxi(fNs), "Unknown");
 }
 
 TEST_F(TCIMSchemaHelperEsxiTest, LogsNothingAndPassesTheProviderNameInItsContext) {
   TLogCapture log;
-  TCIMSchemaHelper::GetSystemProductName_vmwesxi(ns_);
-  TCIMSchemaHelper::GetMTM_vmwesxi(ns_);
-  TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(ns_);
+  TCIMSchemaHelper::GetSystemProductName_vmwesxi(fNs);
+  TCIMSchemaHelper::GetMTM_vmwesxi(fNs);
+  TCIMSchemaHelper::GetOperatingSystemName_vmwesxi(fNs);
   EXPECT_STATUS(SerialNumber(), kZEPStatusNotFound);
   EXPECT_EQ(log.Entries(), TNames());
-  EXPECT_EQ(ns_->fCalls.fNames,
+  EXPECT_EQ(fNs->fCalls.fNames,
             TNames({"CIM_PhysicalElement", "CIM_PhysicalElement", "VMware_HypervisorSoftwareIdentity", "OMC_Chassis"}));
-  EXPECT_EQ(ns_->fCalls.fContexts, std::vector<TCIMContext>(4, TCIMContext{{"nspID", TCIMValue("plugin")}}));
+  EXPECT_EQ(fNs->fCalls.fContexts, std::vector<TCIMContext>(4, TCIMContext{{"nspID", TCIMValue("plugin")}}));
 }
 
 // ---- Against a namespace in memory ----

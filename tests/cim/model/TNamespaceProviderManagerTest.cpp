@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TNamespaceProviderManager.h"
 
 #include "TRootObject.h"
@@ -34,23 +35,23 @@ class TNamespaceProviderManagerTest : public testing::Test {
 protected:
   std::vector<boost::shared_ptr<INamespaceProvider>> Enumerate(std::size_t stopAfter = 1000) {
     std::vector<boost::shared_ptr<INamespaceProvider>> visited;
-    manager_.EnumerateNamespaceProviders([&](boost::shared_ptr<INamespaceProvider> provider) {
+    fManager.EnumerateNamespaceProviders([&](boost::shared_ptr<INamespaceProvider> provider) {
       visited.push_back(provider);
       return visited.size() < stopAfter;
     });
     return visited;
   }
 
-  TNamespaceProviderManager manager_;
+  TNamespaceProviderManager fManager;
 };
 
 TEST_F(TNamespaceProviderManagerTest, FindsAProviderByItsName) {
   auto const disks = ProviderNamed("Disks");
   auto const host = ProviderNamed("Host");
-  manager_.RegisterNamespaceProvider(disks);
-  manager_.RegisterNamespaceProvider(host);
-  EXPECT_EQ(manager_.GetNamespaceProvider("Disks"), disks);
-  EXPECT_EQ(manager_.GetNamespaceProvider("Host"), host);
+  fManager.RegisterNamespaceProvider(disks);
+  fManager.RegisterNamespaceProvider(host);
+  EXPECT_EQ(fManager.GetNamespaceProvider("Disks"), disks);
+  EXPECT_EQ(fManager.GetNamespaceProvider("Host"), host);
 }
 
 TEST_F(TNamespaceProviderManagerTest, TheProcessRegistryIsCreatedWhenTheLibraryIsLoaded) {
@@ -63,14 +64,14 @@ TEST_F(TNamespaceProviderManagerTest, AProviderWhoseGetNameThrowsIsNotRegistered
     TNameless() : TNamedProvider("") {}
     std::string const& GetName(TCIMContext const&) const override { throw TZEPException(kZEPStatusAccessDenied); }
   };
-  EXPECT_STATUS(manager_.RegisterNamespaceProvider(boost::make_shared<TNameless>()), kZEPStatusAccessDenied);
+  EXPECT_STATUS(fManager.RegisterNamespaceProvider(boost::make_shared<TNameless>()), kZEPStatusAccessDenied);
   EXPECT_TRUE(Enumerate().empty());
 }
 
 TEST_F(TNamespaceProviderManagerTest, GetNameIsCalledOnceWithAnEmptyContext) {
   auto const host = ProviderNamed("Host");
-  manager_.RegisterNamespaceProvider(host);
-  manager_.GetNamespaceProvider("Host");
+  fManager.RegisterNamespaceProvider(host);
+  fManager.GetNamespaceProvider("Host");
   Enumerate();
   ASSERT_EQ(host->fContexts.size(), 1u);
   EXPECT_TRUE(host->fContexts[0].empty());
@@ -80,9 +81,9 @@ TEST_F(TNamespaceProviderManagerTest, FirstProviderOfANameStaysAndNothingIsLogge
   auto const first = ProviderNamed("Host");
   auto const second = ProviderNamed("Host");
   TLogCapture log;
-  manager_.RegisterNamespaceProvider(first);
-  manager_.RegisterNamespaceProvider(second);
-  EXPECT_EQ(manager_.GetNamespaceProvider("Host"), first);
+  fManager.RegisterNamespaceProvider(first);
+  fManager.RegisterNamespaceProvider(second);
+  EXPECT_EQ(fManager.GetNamespaceProvider("Host"), first);
   EXPECT_EQ(Enumerate().size(), 1u);
   EXPECT_EQ(second.use_count(), 1);
   EXPECT_EQ(log.Entries(), std::vector<std::string>());
@@ -91,32 +92,32 @@ TEST_F(TNamespaceProviderManagerTest, FirstProviderOfANameStaysAndNothingIsLogge
 TEST_F(TNamespaceProviderManagerTest, NamesThatDifferInCaseAreTwoProviders) {
   auto const upper = ProviderNamed("Host");
   auto const lower = ProviderNamed("host");
-  manager_.RegisterNamespaceProvider(upper);
-  manager_.RegisterNamespaceProvider(lower);
-  EXPECT_EQ(manager_.GetNamespaceProvider("Host"), upper);
-  EXPECT_EQ(manager_.GetNamespaceProvider("host"), lower);
+  fManager.RegisterNamespaceProvider(upper);
+  fManager.RegisterNamespaceProvider(lower);
+  EXPECT_EQ(fManager.GetNamespaceProvider("Host"), upper);
+  EXPECT_EQ(fManager.GetNamespaceProvider("host"), lower);
 }
 
 TEST_F(TNamespaceProviderManagerTest, UnknownNameIsLoggedAsOneErrorAndThrowsNotFound) {
-  manager_.RegisterNamespaceProvider(ProviderNamed("Host"));
+  fManager.RegisterNamespaceProvider(ProviderNamed("Host"));
   for (std::string const name : {"Disks", "host", "Host ", ""}) {
     SCOPED_TRACE(name);
     TLogCapture log;
-    EXPECT_STATUS(manager_.GetNamespaceProvider(name), kZEPStatusNotFound);
+    EXPECT_STATUS(fManager.GetNamespaceProvider(name), kZEPStatusNotFound);
     EXPECT_EQ(log.Entries(), std::vector<std::string>({"[Error] Failed to find nsp named " + name}));
   }
 }
 
 TEST_F(TNamespaceProviderManagerTest, EmptyProviderIsAFailedAssertionAndRegistersNothing) {
   TEnvironmentGuard const mode("ZEP_BOOST_ASSERT", nullptr);
-  EXPECT_STATUS(manager_.RegisterNamespaceProvider(nullptr), kZEPStatusFail);
+  EXPECT_STATUS(fManager.RegisterNamespaceProvider(nullptr), kZEPStatusFail);
   EXPECT_TRUE(Enumerate().empty());
 }
 
 TEST_F(TNamespaceProviderManagerTest, EmptyProviderFailsTheCheckOfThePointer) {
   TEnvironmentGuard const mode("ZEP_BOOST_ASSERT", "throwboost");
   try {
-    manager_.RegisterNamespaceProvider(nullptr);
+    fManager.RegisterNamespaceProvider(nullptr);
     FAIL() << "nothing was thrown";
   } catch (std::exception const& failure) {
     EXPECT_NE(std::string(failure.what()).find(" [px != 0] func = "), std::string::npos) << failure.what();
@@ -128,12 +129,12 @@ TEST_F(TNamespaceProviderManagerTest, EnumeratesInByteOrderOfTheNames) {
   auto const upperB = ProviderNamed("B");
   auto const high = ProviderNamed("\xc3\xa4");
   auto const a = ProviderNamed("a");
-  for (auto const& provider : {b, high, upperB, a}) manager_.RegisterNamespaceProvider(provider);
+  for (auto const& provider : {b, high, upperB, a}) fManager.RegisterNamespaceProvider(provider);
   EXPECT_EQ(Enumerate(), (std::vector<boost::shared_ptr<INamespaceProvider>>{upperB, a, b, high}));
 }
 
 TEST_F(TNamespaceProviderManagerTest, EnumerationStopsAtTheFirstFalse) {
-  for (char const* name : {"a", "b", "c"}) manager_.RegisterNamespaceProvider(ProviderNamed(name));
+  for (char const* name : {"a", "b", "c"}) fManager.RegisterNamespaceProvider(ProviderNamed(name));
   EXPECT_EQ(Enumerate(1).size(), 1u);
   EXPECT_EQ(Enumerate(2).size(), 2u);
   EXPECT_EQ(Enumerate().size(), 3u);

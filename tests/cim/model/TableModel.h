@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // An object model around another one that has only the operations of a table. One that a plug-in may leave out and that is

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // An object model that wraps another one. It records every call that a copy makes, in order, and a test can make any call

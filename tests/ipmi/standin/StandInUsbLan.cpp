@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A stand-in for ovdusblan.so, which logs each call and is controlled by environment variables:
 //
 //   STANDIN_NODES    the number of nodes

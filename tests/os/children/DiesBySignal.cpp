@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints two words and is ended by the signal that its argument names.
 #include <signal.h>
 #include <unistd.h>

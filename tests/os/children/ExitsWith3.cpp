@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints one line and exits with 3.
 #include <cstdio>
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Ends at once and leaves a child of its own behind, which prints later and holds the output open until then.
 #include <unistd.h>
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints as many bytes as its argument says: the alphabet, over and over.
 #include <unistd.h>
 

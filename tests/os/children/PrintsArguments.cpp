@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints each of its arguments, its name among them, in brackets.
 #include <cstdio>
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints the open descriptors above standard error, each with what it names.
 #include <dirent.h>
 #include <unistd.h>

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints each entry of its environment in brackets.
 #include <unistd.h>
 

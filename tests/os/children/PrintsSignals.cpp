@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints what becomes of two signals here: blocked or not, and ignored, caught or left to end the process.
 #include <signal.h>
 

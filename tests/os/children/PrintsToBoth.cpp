@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints to standard output and standard error in turn.
 #include <unistd.h>
 

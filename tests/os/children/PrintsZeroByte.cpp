@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints a chunk with a zero byte in it, and later, as a chunk of its own, one without.
 #include <unistd.h>
 

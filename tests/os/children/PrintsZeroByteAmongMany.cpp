@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints more than one chunk at once, with a zero byte in the first.
 #include <unistd.h>
 

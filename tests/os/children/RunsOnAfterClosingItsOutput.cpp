@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Closes both its outputs, runs on for a while and exits with its argument.
 #include <unistd.h>
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints its process number and stays silent until it is ended, for half a minute at most.
 #include <unistd.h>
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints a full stop, waits as many milliseconds as its first argument says, and so on as often as its second says.
 #include <unistd.h>
 

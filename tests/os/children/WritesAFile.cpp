@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Writes its second argument into the file that its first names, and prints what is of no interest.
 #include <cstdio>
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A stand-in for libcurl: its six functions, which write down how they are called into the record of the test. Without a record
 // it prints the name of its own file.
 

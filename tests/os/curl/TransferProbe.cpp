@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Downloads twice with the library and the libcurl that it is led to, and tells what came of it.
 //
 //   TransferProbe [FROM TO]      links TO to the file FROM between the two

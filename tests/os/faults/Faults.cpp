@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // To be preloaded: makes one call of a named function of the C library fail. ZEP_FAULT says which, as FUNCTION:NUMBER:ERRNO,
 // the number counting the calls of that function from 1; "child." before the function means those of a child before its
 // exec. For write, the errors 0 and -1 stand for a write of nothing and of the first half; for select, the

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A collection plug-in that another one builds on.
 
 #include "ZEPExport.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A collection plug-in that calls a function of another one, without being linked with it.
 
 #include "ZEPExport.h"

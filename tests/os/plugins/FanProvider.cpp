@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A provider plug-in: it registers itself when it is loaded.
 
 #include "INamespaceProvider.h"

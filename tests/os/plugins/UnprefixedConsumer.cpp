@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A consumer plug-in whose factory lacks the base name in front.
 
 #include "INamespaceConsumer.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A library that calls a function which nobody has.
 
 #include "ZEPExport.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Starts a debug session where the library wants its file.
 
 #include "TOSSpecific.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Does one operation of the host services while the preloaded tests/os/faults makes one of its calls fail, and prints what
 // came of it: the result, what was logged, what is left behind.
 //

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Logs from three destructors at the end of the process, and says which ran: of a thread-local object while the main thread
 // still has its logger, of a static object once that logger is gone, and of a registered provider once the logger's own
 // statics are gone as well. Opens the log file that it is given.

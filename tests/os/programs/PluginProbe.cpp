@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Calls one operation on plug-ins and prints what comes of it: the results, one a line; what was thrown; what was recorded in
 // the log, with its severity. With several arguments, one attempt for each.
 //

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Runs one form of spawning a thousand times and prints what that left behind: descriptors, children, allocated bytes.
 
 #include "TOSSpecific.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Calls one operation of the machine identification, given by name, and prints its result and then each line it logged,
 // all ended by a record separator (0x1E). With PROBE_NO_MEMORY_FOR=N the library gets no buffer of N bytes.
 

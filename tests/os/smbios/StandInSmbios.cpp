@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A stand-in for libsmbios.so: does what the environment says and writes each call down.
 //
 //   STANDIN_RECORD       the file that the calls are written to

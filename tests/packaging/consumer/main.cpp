@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Prints where the library lies, the host provider's class of the system, and what an empty pointer ends in.
 
 #include <zepcore.h>

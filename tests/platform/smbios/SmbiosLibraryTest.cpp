@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // libsmbios.so through its C functions, loaded as the core loads it.
 
 #include "platform/include/smbios.h"
@@ -31,32 +33,32 @@ static_assert(int{kSmbiosOk} == kZEPStatusOK && int{kSmbiosFail} == kZEPStatusFa
 class SmbiosLibraryTest : public testing::Test {
 protected:
   void SetUp() override {
-    ASSERT_TRUE(library_) << ::dlerror();
-    ASSERT_TRUE(load_ && getFirst_ && getNext_ && close_);
+    ASSERT_TRUE(fLibrary) << ::dlerror();
+    ASSERT_TRUE(fLoad && fGetFirst && fGetNext && fClose);
   }
 
   // The status of loading a file with these contents; the handle is closed again.
   int LoadStatus(std::string const& contents) {
-    WriteFile(dir_.Path("table"), contents);
-    return LoadStatusOfPath(dir_.Path("table"));
+    WriteFile(fDir.Path("table"), contents);
+    return LoadStatusOfPath(fDir.Path("table"));
   }
   int LoadStatusOfPath(std::string const& path) {
     TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", path.c_str());
     void* handle = this;
-    int const status = load_(nullptr, &handle);
+    int const status = fLoad(nullptr, &handle);
     EXPECT_EQ(handle == nullptr, status != kSmbiosOk);
-    EXPECT_EQ(close_(handle), kSmbiosOk);
+    EXPECT_EQ(fClose(handle), kSmbiosOk);
     return status;
   }
 
   using THandle = std::unique_ptr<void, decltype(&smBiosClose)>;
 
   THandle Open(std::string const& contents) {
-    WriteFile(dir_.Path("table"), contents);
-    TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", dir_.Path("table").c_str());
+    WriteFile(fDir.Path("table"), contents);
+    TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", fDir.Path("table").c_str());
     void* handle = nullptr;
-    EXPECT_EQ(load_(nullptr, &handle), kSmbiosOk);
-    return THandle(handle, close_);
+    EXPECT_EQ(fLoad(nullptr, &handle), kSmbiosOk);
+    return THandle(handle, fClose);
   }
 
   // What a call copies into a buffer of that size, and the length it says, as "status length bytes".
@@ -74,15 +76,15 @@ protected:
     }
     return std::to_string(length) + " " + bytes.substr(0, static_cast<std::size_t>(std::min(length, size)));
   }
-  std::string First(THandle const& handle, int type, int size = 4096) { return Got(getFirst_, handle, type, size); }
-  std::string Next(THandle const& handle, int type, int size = 4096) { return Got(getNext_, handle, type, size); }
+  std::string First(THandle const& handle, int type, int size = 4096) { return Got(fGetFirst, handle, type, size); }
+  std::string Next(THandle const& handle, int type, int size = 4096) { return Got(fGetNext, handle, type, size); }
 
-  TTempDir dir_;
-  TSharedLibrary library_{::dlopen(ZEP_SMBIOS_LIBRARY, RTLD_NOW)};
-  decltype(&smBiosLoad) load_ = FunctionOf<decltype(smBiosLoad)>(library_.get(), "smBiosLoad");
-  decltype(&smBiosGetFirst) getFirst_ = FunctionOf<decltype(smBiosGetFirst)>(library_.get(), "smBiosGetFirst");
-  decltype(&smBiosGetNext) getNext_ = FunctionOf<decltype(smBiosGetNext)>(library_.get(), "smBiosGetNext");
-  decltype(&smBiosClose) close_ = FunctionOf<decltype(smBiosClose)>(library_.get(), "smBiosClose");
+  TTempDir fDir;
+  TSharedLibrary fLibrary{::dlopen(ZEP_SMBIOS_LIBRARY, RTLD_NOW)};
+  decltype(&smBiosLoad) fLoad = FunctionOf<decltype(smBiosLoad)>(fLibrary.get(), "smBiosLoad");
+  decltype(&smBiosGetFirst) fGetFirst = FunctionOf<decltype(smBiosGetFirst)>(fLibrary.get(), "smBiosGetFirst");
+  decltype(&smBiosGetNext) fGetNext = FunctionOf<decltype(smBiosGetNext)>(fLibrary.get(), "smBiosGetNext");
+  decltype(&smBiosClose) fClose = FunctionOf<decltype(smBiosClose)>(fLibrary.get(), "smBiosClose");
 };
 
 std::string Whole(std::string const& structure) { return std::to_string(structure.size()) + " " + structure; }
@@ -153,9 +155,9 @@ TEST_F(SmbiosLibraryTest, LoadSaysWhyItFails) {
     SCOPED_TRACE(row.what);
     EXPECT_EQ(LoadStatus(row.contents), row.status);
   }
-  EXPECT_EQ(LoadStatusOfPath(dir_.Path("absent")), kSmbiosFileNotFound);
-  EXPECT_EQ(LoadStatusOfPath(dir_.Path("table/below a file")), kSmbiosFileNotFound);
-  EXPECT_EQ(LoadStatusOfPath(dir_.Path()), kSmbiosFail) << "a directory";
+  EXPECT_EQ(LoadStatusOfPath(fDir.Path("absent")), kSmbiosFileNotFound);
+  EXPECT_EQ(LoadStatusOfPath(fDir.Path("table/below a file")), kSmbiosFileNotFound);
+  EXPECT_EQ(LoadStatusOfPath(fDir.Path()), kSmbiosFail) << "a directory";
   EXPECT_EQ(LoadStatusOfPath("/dev/zero"), kSmbiosFail) << "a device has no end";
 }
 
@@ -163,33 +165,33 @@ TEST_F(SmbiosLibraryTest, LoadOfAFileThatCannotBeReadLeavesTheReasonInErrno) {
   EXPECT_EQ(LoadStatusOfPath("/proc/self/mem"), kSmbiosFileSystemError) << "a read that fails";
   EXPECT_EQ(errno, EIO);
 
-  WriteFile(dir_.Path("table"), RealTable("full"));
+  WriteFile(fDir.Path("table"), RealTable("full"));
   rlimit limit;
   ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &limit), 0);
   rlimit const none{0, limit.rlim_max};
   ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &none), 0);
-  int const status = LoadStatusOfPath(dir_.Path("table")), error = errno;
+  int const status = LoadStatusOfPath(fDir.Path("table")), error = errno;
   ::setrlimit(RLIMIT_NOFILE, &limit);
   EXPECT_EQ(status, kSmbiosFileSystemError) << "no descriptor left";
   EXPECT_EQ(error, EMFILE);
 }
 
 TEST_F(SmbiosLibraryTest, LoadDoesNotWaitForAWriterOfAPipe) {
-  ASSERT_EQ(::mkfifo(dir_.Path("fifo").c_str(), 0600), 0);
-  EXPECT_EQ(LoadStatusOfPath(dir_.Path("fifo")), kSmbiosFail);
+  ASSERT_EQ(::mkfifo(fDir.Path("fifo").c_str(), 0600), 0);
+  EXPECT_EQ(LoadStatusOfPath(fDir.Path("fifo")), kSmbiosFail);
 }
 
 TEST_F(SmbiosLibraryTest, LoadWithoutTheRightToReadIsAccessDenied) {
-  WriteFile(dir_.Path("secret"), RealTable("full"));
-  ASSERT_EQ(::chmod(dir_.Path("secret").c_str(), 0), 0);
-  ASSERT_EQ(::chmod(dir_.Path().c_str(), 0755), 0);
+  WriteFile(fDir.Path("secret"), RealTable("full"));
+  ASSERT_EQ(::chmod(fDir.Path("secret").c_str(), 0), 0);
+  ASSERT_EQ(::chmod(fDir.Path().c_str(), 0755), 0);
   pid_t const child = ::fork();
   if (child == 0) {
     constexpr int kNobody = 65534, kNotRun = 255;
     if (::geteuid() == 0 && ::setresuid(kNobody, kNobody, kNobody) != 0) ::_exit(kNotRun);
-    ::setenv("ZEP_SMBIOS_TABLE", dir_.Path("secret").c_str(), 1);
+    ::setenv("ZEP_SMBIOS_TABLE", fDir.Path("secret").c_str(), 1);
     void* handle = nullptr;
-    ::_exit(load_(nullptr, &handle));
+    ::_exit(fLoad(nullptr, &handle));
   }
   int status = 0;
   ASSERT_EQ(::waitpid(child, &status, 0), child);
@@ -202,8 +204,8 @@ TEST_F(SmbiosLibraryTest, WithoutTheVariableTheKernelsTablesAreRead) {
   for (char const* variable : {static_cast<char const*>(nullptr), ""}) {
     TEnvironmentGuard const none("ZEP_SMBIOS_TABLE", variable);
     void* handle = nullptr;
-    int const status = load_(nullptr, &handle);
-    THandle const opened(handle, close_);
+    int const status = fLoad(nullptr, &handle);
+    THandle const opened(handle, fClose);
     if (::access(kKernelTable, F_OK) != 0) {
       EXPECT_EQ(status, kSmbiosFileNotFound);
     } else if (::access(kKernelTable, R_OK) != 0) {
@@ -228,15 +230,15 @@ TEST_F(SmbiosLibraryTest, AChangedFileIsReadAgain) {
   EXPECT_EQ(First(Open(Structure(1, "two")), 1), Whole(Structure(1, "two"))) << "changed at once, same size";
 
   std::this_thread::sleep_for(std::chrono::milliseconds(2100));
-  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", dir_.Path("table").c_str());
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", fDir.Path("table").c_str());
   for (int time = 0; time < 3; ++time) {
     void* handle = nullptr;
-    ASSERT_EQ(load_(nullptr, &handle), kSmbiosOk);
-    EXPECT_EQ(First(THandle(handle, close_), 1), Whole(Structure(1, "two"))) << "left alone";
+    ASSERT_EQ(fLoad(nullptr, &handle), kSmbiosOk);
+    EXPECT_EQ(First(THandle(handle, fClose), 1), Whole(Structure(1, "two"))) << "left alone";
   }
   EXPECT_EQ(First(Open(Structure(1, "six")), 1), Whole(Structure(1, "six"))) << "changed after it was kept";
-  std::filesystem::remove(dir_.Path("table"));
-  EXPECT_EQ(LoadStatusOfPath(dir_.Path("table")), kSmbiosFileNotFound);
+  std::filesystem::remove(fDir.Path("table"));
+  EXPECT_EQ(LoadStatusOfPath(fDir.Path("table")), kSmbiosFileNotFound);
 }
 
 TEST_F(SmbiosLibraryTest, ThreadsOpenAndReadAtOnce) {
@@ -248,7 +250,7 @@ TEST_F(SmbiosLibraryTest, ThreadsOpenAndReadAtOnce) {
     threads.emplace_back([&] {
       for (int time = 0; time < 200; ++time) {
         void* handle = nullptr;
-        if (load_(nullptr, &handle) == kSmbiosOk) right += First(THandle(handle, close_), 1) == system;
+        if (fLoad(nullptr, &handle) == kSmbiosOk) right += First(THandle(handle, fClose), 1) == system;
       }
     });
   for (std::thread& thread : threads) thread.join();
@@ -256,11 +258,11 @@ TEST_F(SmbiosLibraryTest, ThreadsOpenAndReadAtOnce) {
 }
 
 TEST_F(SmbiosLibraryTest, TheProviderIsNotLookedAt) {
-  WriteFile(dir_.Path("table"), RealTable("full"));
-  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", dir_.Path("table").c_str());
+  WriteFile(fDir.Path("table"), RealTable("full"));
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", fDir.Path("table").c_str());
   void* handle = nullptr;
-  EXPECT_EQ(load_(reinterpret_cast<void*>(1), &handle), kSmbiosOk);
-  EXPECT_EQ(close_(handle), kSmbiosOk);
+  EXPECT_EQ(fLoad(reinterpret_cast<void*>(1), &handle), kSmbiosOk);
+  EXPECT_EQ(fClose(handle), kSmbiosOk);
 }
 
 TEST_F(SmbiosLibraryTest, OfAHugeFileTheFirst16MiBAreLookedAt) {
@@ -294,14 +296,14 @@ TEST_F(SmbiosLibraryTest, AStructureIsCutToTheBufferAndItsLengthTold) {
     EXPECT_EQ(First(handle, 1, static_cast<int>(size)), std::to_string(structure.size()) + " " + structure.substr(0, size));
   }
   int length = 0;
-  EXPECT_EQ(getFirst_(handle.get(), 1, nullptr, &length), kSmbiosOk);
+  EXPECT_EQ(fGetFirst(handle.get(), 1, nullptr, &length), kSmbiosOk);
   EXPECT_EQ(length, static_cast<int>(structure.size()));
 }
 
 TEST_F(SmbiosLibraryTest, ArgumentsThatCannotBeUsedFail) {
   THandle const handle = Open(RealTable("full"));
   char buffer[16] = {};
-  for (auto const get : {getFirst_, getNext_}) {
+  for (auto const get : {fGetFirst, fGetNext}) {
     int length = sizeof buffer;
     EXPECT_EQ(get(nullptr, 1, buffer, &length), kSmbiosFail);
     EXPECT_EQ(get(handle.get(), 1, buffer, nullptr), kSmbiosFail);
@@ -311,8 +313,8 @@ TEST_F(SmbiosLibraryTest, ArgumentsThatCannotBeUsedFail) {
     EXPECT_EQ(get(handle.get(), 1, buffer, &length), kSmbiosFail);
     EXPECT_EQ(length, -1);
   }
-  EXPECT_EQ(load_(nullptr, nullptr), kSmbiosFail);
-  EXPECT_EQ(close_(nullptr), kSmbiosOk);
+  EXPECT_EQ(fLoad(nullptr, nullptr), kSmbiosFail);
+  EXPECT_EQ(fClose(nullptr), kSmbiosOk);
 }
 
 TEST_F(SmbiosLibraryTest, GetNextGivesTheStructuresOfATypeOneByOne) {

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The parser of libsmbios.so: structures out of real, damaged and hostile bytes.
 
 #include "platform/smbios/SmbiosTable.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Which interfaces lead to a controller, and whether they reach it.
 
 #include "platform/usblan/Interfaces.h"
@@ -53,17 +55,17 @@ TEST(UsbLanAddressTest, AnInterfaceReachesTheControllerOfItsNetworkWhileItIsUp) 
 class ControllerInterfacesTest : public testing::Test {
 protected:
   void AddInterface(std::string const& name, std::string const& driver) {
-    std::filesystem::create_directories(dir_.Path(name + "/device"));
-    std::filesystem::create_directory_symlink("../../../bus/usb/drivers/" + driver, dir_.Path(name + "/device/driver"));
+    std::filesystem::create_directories(fDir.Path(name + "/device"));
+    std::filesystem::create_directory_symlink("../../../bus/usb/drivers/" + driver, fDir.Path(name + "/device/driver"));
   }
 
   std::vector<std::string> Found(std::vector<TInterface> const& all, std::string const& named = "") {
     std::vector<std::string> names;
-    for (TInterface const& interface : ControllerInterfaces(all, named, dir_.Path())) names.push_back(interface.name);
+    for (TInterface const& interface : ControllerInterfaces(all, named, fDir.Path())) names.push_back(interface.name);
     return names;
   }
 
-  TTempDir dir_;
+  TTempDir fDir;
 };
 
 TEST_F(ControllerInterfacesTest, UsbNetworkInterfacesLeadToAController) {
@@ -72,7 +74,7 @@ TEST_F(ControllerInterfacesTest, UsbNetworkInterfacesLeadToAController) {
   AddInterface("usb1", "rndis_host");
   AddInterface("usb2", "cdc_subset");
   AddInterface("wlan0", "cdc_ether_of_another_kind");
-  std::filesystem::create_directories(dir_.Path("dummy0"));  // no device
+  std::filesystem::create_directories(fDir.Path("dummy0"));  // no device
   EXPECT_THAT(Found({{"dummy0"}, {"enp1s0"}, {"lo"}, {"usb0"}, {"usb1"}, {"usb2"}, {"wlan0"}}),
               ElementsAre("usb0", "usb1", "usb2"));
   EXPECT_THAT(Found({}), IsEmpty());
@@ -95,7 +97,7 @@ TEST_F(ControllerInterfacesTest, NamedOnesCountInTheirOrder) {
 }
 
 TEST_F(ControllerInterfacesTest, ANamedOneThatIsMissingKeepsItsPlace) {
-  std::vector<TInterface> const nodes = ControllerInterfaces({{"veth0"}, {"veth1"}}, "absent veth1 gone veth0", dir_.Path());
+  std::vector<TInterface> const nodes = ControllerInterfaces({{"veth0"}, {"veth1"}}, "absent veth1 gone veth0", fDir.Path());
   ASSERT_EQ(nodes.size(), 4u);
   for (std::size_t node : {0, 2}) EXPECT_FALSE(nodes[node].isThere) << node;
   EXPECT_EQ(nodes[1].name, "veth1");

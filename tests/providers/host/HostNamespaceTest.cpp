@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The namespace that the provider fills, read as a front end reads it.
 
 #include "providers/host/HostNamespace.h"
@@ -41,18 +43,18 @@ protected:
   void FillFromFile(std::string const& path) {
     TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", path.c_str());
     TEnvironmentGuard const name("ZEP_HOST_NAME", "db1");
-    TEnvironmentGuard const scsi("ZEP_SCSI_DEVICES", scsiDevices_.c_str());
-    ns_ = boost::make_shared<TMemoryNamespace>("root/test");
-    FillHostNamespace(*ns_);
+    TEnvironmentGuard const scsi("ZEP_SCSI_DEVICES", fScsiDevices.c_str());
+    fNs = boost::make_shared<TMemoryNamespace>("root/test");
+    FillHostNamespace(*fNs);
   }
   void Fill(std::string const& table) {
-    WriteFile(dir_.Path("table"), table);
-    FillFromFile(dir_.Path("table"));
+    WriteFile(fDir.Path("table"), table);
+    FillFromFile(fDir.Path("table"));
   }
 
   TInstances InstancesOf(std::string const& className) {
     TInstances instances;
-    ns_->GetClass(className, TCIMContext())->EnumerateInstances(TAddToVectorCallback<ICIMInstance>(instances), TCIMContext());
+    fNs->GetClass(className, TCIMContext())->EnumerateInstances(TAddToVectorCallback<ICIMInstance>(instances), TCIMContext());
     return instances;
   }
 
@@ -75,9 +77,9 @@ protected:
     return missing;
   }
 
-  TTempDir dir_;
-  std::string scsiDevices_ = dir_.Path("no-scsi");
-  boost::shared_ptr<TMemoryNamespace> ns_;
+  TTempDir fDir;
+  std::string fScsiDevices = fDir.Path("no-scsi");
+  boost::shared_ptr<TMemoryNamespace> fNs;
 };
 
 // The value, or the status that is thrown.
@@ -104,13 +106,13 @@ TEST_F(HostNamespaceTest, TheSchemaHelperReadsTheRealTables) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.table);
     FillFromFile(RealTablePath(row.table));
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSystemProductName(ns_); }), row.product);
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetMTM(ns_); }), row.mtm);
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSerialNumber(ns_, TCIMContext()); }), row.serial);
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSystemName(ns_); }), "db1");
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetDataSourceVersion(ns_, TCIMContext()); }), TEST_VERSION);
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetDataSourceBuild(ns_, TCIMContext()); }), TEST_BUILD_ID);
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetOperatingSystemType(ns_); }), "Linux");
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSystemProductName(fNs); }), row.product);
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetMTM(fNs); }), row.mtm);
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSerialNumber(fNs, TCIMContext()); }), row.serial);
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSystemName(fNs); }), "db1");
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetDataSourceVersion(fNs, TCIMContext()); }), TEST_VERSION);
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetDataSourceBuild(fNs, TCIMContext()); }), TEST_BUILD_ID);
+    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetOperatingSystemType(fNs); }), "Linux");
   }
 }
 
@@ -146,7 +148,7 @@ TEST_F(HostNamespaceTest, TheUuidIsThatOfDmidecodeWhateverTheVersion) {
     Fill(entryPoint + table);
     std::string uuid = TextOfOnly("QRVSG_ComputerSystem", "UUID");
     for (char& c : uuid) c = static_cast<char>(std::tolower(c));
-    EXPECT_EQ(uuid + "\n", OutputOfCommand(dmidecode.substr(0, dmidecode.find('\n')) + " --from-dump " + dir_.Path("table") +
+    EXPECT_EQ(uuid + "\n", OutputOfCommand(dmidecode.substr(0, dmidecode.find('\n')) + " --from-dump " + fDir.Path("table") +
                                            " -s system-uuid 2>/dev/null | tr A-F a-f"));
     seen.insert(uuid);
   }
@@ -159,7 +161,7 @@ TEST_F(HostNamespaceTest, ABareTablesUuidFollowsTheEntryPointBesideIt) {
       EndOfTable();
   Fill(table);
   EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "UUID"), "00112233-4455-6677-8899-AABBCCDDEEFF");
-  WriteFile(dir_.Path("smbios_entry_point"), EntryPoint32(table.size(), 0xE0000, 0x1F, 0x204).substr(0, 0x1F));
+  WriteFile(fDir.Path("smbios_entry_point"), EntryPoint32(table.size(), 0xE0000, 0x1F, 0x204).substr(0, 0x1F));
   Fill(table);
   EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "UUID"), "33221100-5544-7766-8899-AABBCCDDEEFF");
 }
@@ -167,7 +169,7 @@ TEST_F(HostNamespaceTest, ABareTablesUuidFollowsTheEntryPointBesideIt) {
 TEST_F(HostNamespaceTest, ClassesComeInAFixedOrder) {
   FillFromFile(SamplePath());
   std::vector<std::string> names;
-  ns_->EnumerateClasses(
+  fNs->EnumerateClasses(
       [&](boost::shared_ptr<ICIMClass> cls) {
         names.push_back(cls->GetName(TCIMContext()));
         return true;
@@ -179,7 +181,7 @@ TEST_F(HostNamespaceTest, ClassesComeInAFixedOrder) {
 
 TEST_F(HostNamespaceTest, ADeclarationTellsKeyTypeAndSource) {
   FillFromFile(SamplePath());
-  auto const cls = ns_->GetClass("QRVSG_ComputerSystem", TCIMContext());
+  auto const cls = fNs->GetClass("QRVSG_ComputerSystem", TCIMContext());
   auto const source = [&](char const* property) {
     auto const qualifier = cls->GetPropertyDecl(property, TCIMContext())->GetQualifier("ValueSource", TCIMContext());
     return qualifier ? qualifier->GetValue(TCIMContext()).ToString() : "none";
@@ -190,18 +192,18 @@ TEST_F(HostNamespaceTest, ADeclarationTellsKeyTypeAndSource) {
   EXPECT_TRUE(cls->GetPropertyDecl("Name", TCIMContext())->IsKey(TCIMContext()));
   EXPECT_FALSE(cls->GetPropertyDecl("SerialNumber", TCIMContext())->IsKey(TCIMContext()));
   EXPECT_EQ(
-      ns_->GetClass("CIM_PhysicalMemory", TCIMContext())->GetPropertyDecl("Capacity", TCIMContext())->GetType(TCIMContext()),
+      fNs->GetClass("CIM_PhysicalMemory", TCIMContext())->GetPropertyDecl("Capacity", TCIMContext())->GetType(TCIMContext()),
       TCIMValue::TCIMType::kCIMTypeUint64);
 }
 
 TEST_F(HostNamespaceTest, EveryInstanceIsFoundByItsPath) {
   FillFromFile(SamplePath());
   int found = 0;
-  ns_->EnumerateClasses(
+  fNs->EnumerateClasses(
       [&](boost::shared_ptr<ICIMClass> cls) {
         for (auto const& instance : InstancesOf(cls->GetName(TCIMContext()))) {
           std::string const path = "root/test:" + instance->GetPath(TCIMContext()).GetPath();
-          EXPECT_EQ(TCIMReference(ns_, path, TCIMContext()).GetCIMElement(false), instance) << path;
+          EXPECT_EQ(TCIMReference(fNs, path, TCIMContext()).GetCIMElement(false), instance) << path;
           ++found;
         }
         return true;
@@ -242,8 +244,8 @@ TEST_F(HostNamespaceTest, NothingIsNullWithoutAReason) {
 }
 
 TEST_F(HostNamespaceTest, WithoutTablesTheMachineStillHasANameAndASystem) {
-  FillFromFile(dir_.Path("nothing"));
-  std::string const reason = "the SMBIOS table file " + dir_.Path("nothing") + " does not exist";
+  FillFromFile(fDir.Path("nothing"));
+  std::string const reason = "the SMBIOS table file " + fDir.Path("nothing") + " does not exist";
   EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "Name"), "db1");
   EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "SerialNumber"), "NULL");
   EXPECT_EQ(TextOfOnly("QRVSG_OperatingSystem", "OSType"), "Linux");
@@ -288,12 +290,12 @@ TEST_F(HostNamespaceTest, AMangledTableFillsANamespaceAllTheSame) {
 TEST_F(HostNamespaceTest, AHostNameThatNobodySetIsMissingEverywhere) {
   TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", SamplePath().c_str());
   TEnvironmentGuard const name("ZEP_HOST_NAME", nullptr);
-  TEnvironmentGuard const scsi("ZEP_SCSI_DEVICES", scsiDevices_.c_str());
-  ns_ = boost::make_shared<TMemoryNamespace>("root/test");
+  TEnvironmentGuard const scsi("ZEP_SCSI_DEVICES", fScsiDevices.c_str());
+  fNs = boost::make_shared<TMemoryNamespace>("root/test");
   bool isNamedSo = false;
   std::thread([&] {  // the name is that of this thread alone
     isNamedSo = ::unshare(CLONE_NEWUTS) == 0 && ::sethostname("(none)", 6) == 0;
-    if (isNamedSo) FillHostNamespace(*ns_);
+    if (isNamedSo) FillHostNamespace(*fNs);
   })
       .join();
   NEEDS(isNamedSo, "only root may change the host name");
@@ -309,8 +311,8 @@ TEST_F(HostNamespaceTest, AHostNameThatNobodySetIsMissingEverywhere) {
 // ---- SCSI devices ----
 
 TEST_F(HostNamespaceTest, ScsiDevicesAreThoseOfSysfs) {
-  scsiDevices_ = dir_.Path("scsi");
-  TScsiDirectory(scsiDevices_).Add("1:0:0:0", "0", "Example ", "Virtual Disk    ", "0601");
+  fScsiDevices = fDir.Path("scsi");
+  TScsiDirectory(fScsiDevices).Add("1:0:0:0", "0", "Example ", "Virtual Disk    ", "0601");
   FillFromFile(SamplePath());
   EXPECT_EQ(TextOfOnly("QRVSG_SCSIDevice", "DeviceType"), "Direct Access Device");
   EXPECT_EQ(TextOfOnly("QRVSG_SCSIDevice", "DeviceID"), "1:0:0:0");
@@ -326,11 +328,11 @@ TEST_F(HostNamespaceTest, WithoutScsiDevicesTheClassIsThereAndSaysWhyItIsEmpty) 
   FillFromFile(SamplePath());
   EXPECT_THAT(InstancesOf("QRVSG_SCSIDevice"), IsEmpty());
   EXPECT_THAT(MissingOf("QRVSG_SCSIDevice"),
-              ElementsAre(": the kernel shows no SCSI devices: " + scsiDevices_ + " does not exist"));
-  scsiDevices_ = dir_.Path("scsi");
-  TScsiDirectory const empty(scsiDevices_);
+              ElementsAre(": the kernel shows no SCSI devices: " + fScsiDevices + " does not exist"));
+  fScsiDevices = fDir.Path("scsi");
+  TScsiDirectory const empty(fScsiDevices);
   FillFromFile(SamplePath());
-  EXPECT_THAT(MissingOf("QRVSG_SCSIDevice"), ElementsAre(": there are no SCSI devices in " + scsiDevices_));
+  EXPECT_THAT(MissingOf("QRVSG_SCSIDevice"), ElementsAre(": there are no SCSI devices in " + fScsiDevices));
 }
 
 // ---- The plug-in ----

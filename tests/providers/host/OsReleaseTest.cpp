@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/host/HostRecords.h"
 #include "providers/host/OsRelease.h"
 #include "tests/Support.h"

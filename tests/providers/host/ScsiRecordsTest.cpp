@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/host/ScsiRecords.h"
 
 #include "tests/providers/host/ScsiDirectory.h"
@@ -15,7 +16,7 @@ protected:
   // "DeviceID|DeviceType|VendorID|ProductID|ProductRevision" of each record, with the reason for what is missing.
   std::vector<std::string> Records() const {
     std::vector<std::string> texts;
-    for (TRecord const& record : ScsiRecords(path_, {"db1", "uname"})) {
+    for (TRecord const& record : ScsiRecords(fPath, {"db1", "uname"})) {
       std::string text;
       for (TRecordProperty const& property : record.GetProperties())
         if (property.fName.find("System") == property.fName.npos && property.fName != "CreationClassName")
@@ -26,14 +27,14 @@ protected:
     return texts;
   }
 
-  TTempDir dir_;
-  std::string path_ = dir_.Path("devices");
-  TScsiDirectory devices_{path_};
+  TTempDir fDir;
+  std::string fPath = fDir.Path("devices");
+  TScsiDirectory fDevices{fPath};
 };
 
 TEST_F(ScsiRecordsTest, DevicesComeInTheOrderOfTheirAddresses) {
   for (char const* name : {"10:0:0:0", "2:0:0:1", "2:0:0:0", "2:0:10:0", "2:0:9:0", "2:1:0:0", "0:0:0:0"})
-    devices_.Add(name, "0", "V", "M", "R");
+    fDevices.Add(name, "0", "V", "M", "R");
   EXPECT_THAT(Records(), ElementsAre("0:0:0:0|Direct Access Device|V|M|R", "2:0:0:0|Direct Access Device|V|M|R",
                                      "2:0:0:1|Direct Access Device|V|M|R", "2:0:9:0|Direct Access Device|V|M|R",
                                      "2:0:10:0|Direct Access Device|V|M|R", "2:1:0:0|Direct Access Device|V|M|R",
@@ -42,7 +43,7 @@ TEST_F(ScsiRecordsTest, DevicesComeInTheOrderOfTheirAddresses) {
 
 TEST_F(ScsiRecordsTest, HostsAndTargetsAreNoDevices) {
   for (char const* name : {"host0", "target0:0:0", "0:0:0", "0:0:0:0:0", "0:0:0:0x", "x0:0:0:0"})
-    devices_.Add(name, "0", "V", "M", "R");
+    fDevices.Add(name, "0", "V", "M", "R");
   EXPECT_THAT(Records(), IsEmpty());
 }
 
@@ -74,37 +75,37 @@ TEST_F(ScsiRecordsTest, EveryTypeHasItsName) {
       {"-1", "<\"-1\" is no type of SCSI devices>"},
   };
   for (TRow const& row : rows) {
-    devices_.Add("0:0:0:0", row.type, "V", "M", "R");
+    fDevices.Add("0:0:0:0", row.type, "V", "M", "R");
     EXPECT_THAT(Records(), ElementsAre(std::string("0:0:0:0|") + row.name + "|V|M|R")) << row.type;
   }
 }
 
 TEST_F(ScsiRecordsTest, TextsLoseTheBlanksTheyAreFilledUpWith) {
-  devices_.Add("0:0:0:0", "5", "QEMU    ", "  QEMU CD-ROM   ", "2.5+");
+  fDevices.Add("0:0:0:0", "5", "QEMU    ", "  QEMU CD-ROM   ", "2.5+");
   EXPECT_THAT(Records(), ElementsAre("0:0:0:0|CD-ROM Device|QEMU|QEMU CD-ROM|2.5+"));
 }
 
 TEST_F(ScsiRecordsTest, WhatADeviceDoesNotGiveSaysWhy) {
-  devices_.Add("0:0:0:0", "0", "        ", "M", "R");
-  std::filesystem::remove(path_ + "/0:0:0:0/rev");
-  EXPECT_THAT(Records(), ElementsAre("0:0:0:0|Direct Access Device|<the device gives a blank text>|M|<" + path_ +
+  fDevices.Add("0:0:0:0", "0", "        ", "M", "R");
+  std::filesystem::remove(fPath + "/0:0:0:0/rev");
+  EXPECT_THAT(Records(), ElementsAre("0:0:0:0|Direct Access Device|<the device gives a blank text>|M|<" + fPath +
                                      "/0:0:0:0/rev cannot be read>"));
 }
 
 TEST_F(ScsiRecordsTest, ADeviceThatGoesAwayMeanwhileIsLeftOut) {
-  devices_.Add("0:0:0:0", "0", "V", "M", "R");
-  std::filesystem::create_directory_symlink("nowhere", path_ + "/1:0:0:0");
+  fDevices.Add("0:0:0:0", "0", "V", "M", "R");
+  std::filesystem::create_directory_symlink("nowhere", fPath + "/1:0:0:0");
   EXPECT_THAT(Records(), ElementsAre("0:0:0:0|Direct Access Device|V|M|R"));
 }
 
 TEST_F(ScsiRecordsTest, WithoutTheDirectoryThereAreNone) {
-  std::filesystem::remove(path_);
+  std::filesystem::remove(fPath);
   EXPECT_THAT(Records(), IsEmpty());
 }
 
 TEST_F(ScsiRecordsTest, TheDirectoryIsTheKernelsUnlessATestSaysOtherwise) {
-  TEnvironmentGuard const named("ZEP_SCSI_DEVICES", path_.c_str());
-  EXPECT_EQ(ScsiDirectory(), path_);
+  TEnvironmentGuard const named("ZEP_SCSI_DEVICES", fPath.c_str());
+  EXPECT_EQ(ScsiDirectory(), fPath);
   TEnvironmentGuard const empty("ZEP_SCSI_DEVICES", "");
   EXPECT_EQ(ScsiDirectory(), "/sys/bus/scsi/devices");
   TEnvironmentGuard const unset("ZEP_SCSI_DEVICES", nullptr);

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/host/SmbiosVersion.h"
 
 #include "tests/SmbiosTables.h"
@@ -58,29 +59,29 @@ TEST(SmbiosVersionTest, ADamagedEntryPointHasNone) {
 class VersionOfTablesTest : public testing::Test {
 protected:
   std::string VersionOf(std::string const& table) {
-    WriteFile(dir_.Path("DMI"), table);
-    return VersionText(VersionOfTables(dir_.Path("DMI")));
+    WriteFile(fDir.Path("DMI"), table);
+    return VersionText(VersionOfTables(fDir.Path("DMI")));
   }
-  TTempDir dir_;
+  TTempDir fDir;
 };
 
 TEST_F(VersionOfTablesTest, ADumpBeginsWithIt) {
-  WriteFile(dir_.Path("smbios_entry_point"), EntryPoint64(100));
+  WriteFile(fDir.Path("smbios_entry_point"), EntryPoint64(100));
   EXPECT_EQ(VersionOf(EntryPoint32(100, 32, 0x1F, 0x204) + RealTable("full")), "2.4") << "not the file beside it";
 }
 
 TEST_F(VersionOfTablesTest, ABareTableHasItBesideIt) {
   EXPECT_EQ(VersionOf(RealTable("full")), "none");
-  WriteFile(dir_.Path("smbios_entry_point"), EntryPoint32(100, 32, 0x1F, 0x204).substr(0, 0x1F));
+  WriteFile(fDir.Path("smbios_entry_point"), EntryPoint32(100, 32, 0x1F, 0x204).substr(0, 0x1F));
   EXPECT_EQ(VersionOf(RealTable("full")), "2.4");
-  WriteFile(dir_.Path("smbios_entry_point"), EntryPointLegacy(100).substr(0, 0x0F));
+  WriteFile(fDir.Path("smbios_entry_point"), EntryPointLegacy(100).substr(0, 0x0F));
   EXPECT_EQ(VersionOf(RealTable("full")), "2.0");
-  WriteFile(dir_.Path("smbios_entry_point"), "");
+  WriteFile(fDir.Path("smbios_entry_point"), "");
   EXPECT_EQ(VersionOf(RealTable("full")), "none");
 }
 
 TEST_F(VersionOfTablesTest, APipeInItsPlaceIsNotWaitedFor) {
-  ASSERT_EQ(::mkfifo(dir_.Path("smbios_entry_point").c_str(), 0600), 0);
+  ASSERT_EQ(::mkfifo(fDir.Path("smbios_entry_point").c_str(), 0600), 0);
   EXPECT_EQ(VersionOf(RealTable("full")), "none");
 }
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/host/TSmbiosReader.h"
 
 #include "core/Handles.h"
@@ -21,27 +22,27 @@ class TSmbiosReaderTest : public testing::Test {
 protected:
   // Reads this table instead of the machine's.
   void Read(std::string const& table) {
-    WriteFile(dir_.Path("table"), table);
-    guard_.reset();
-    guard_ = std::make_unique<TEnvironmentGuard>("ZEP_SMBIOS_TABLE", dir_.Path("table").c_str());
-    reader_ = std::make_unique<TSmbiosReader>();
+    WriteFile(fDir.Path("table"), table);
+    fGuard.reset();
+    fGuard = std::make_unique<TEnvironmentGuard>("ZEP_SMBIOS_TABLE", fDir.Path("table").c_str());
+    fReader = std::make_unique<TSmbiosReader>();
   }
   void ReadFrom(std::string const& path) {
-    guard_.reset();
-    guard_ = std::make_unique<TEnvironmentGuard>("ZEP_SMBIOS_TABLE", path.c_str());
-    reader_ = std::make_unique<TSmbiosReader>();
+    fGuard.reset();
+    fGuard = std::make_unique<TEnvironmentGuard>("ZEP_SMBIOS_TABLE", path.c_str());
+    fReader = std::make_unique<TSmbiosReader>();
   }
 
   // Text 1 of each structure of that type, whose first field numbers it.
   std::vector<std::string> TextsOf(int type) {
     std::vector<std::string> texts;
-    for (TSmbiosStructure const& structure : reader_->All(type)) texts.push_back(*structure.Text(4));
+    for (TSmbiosStructure const& structure : fReader->All(type)) texts.push_back(*structure.Text(4));
     return texts;
   }
 
-  TTempDir dir_;
-  std::unique_ptr<TEnvironmentGuard> guard_;
-  std::unique_ptr<TSmbiosReader> reader_;
+  TTempDir fDir;
+  std::unique_ptr<TEnvironmentGuard> fGuard;
+  std::unique_ptr<TSmbiosReader> fReader;
 };
 
 TEST_F(TSmbiosReaderTest, AllStructuresOfATypeComeInTableOrder) {
@@ -50,15 +51,15 @@ TEST_F(TSmbiosReaderTest, AllStructuresOfATypeComeInTableOrder) {
   EXPECT_THAT(TextsOf(17), ElementsAre("a", "b", "c"));
   EXPECT_THAT(TextsOf(4), ElementsAre("other"));
   EXPECT_THAT(TextsOf(17), ElementsAre("a", "b", "c")) << "a second time";
-  EXPECT_EQ(*reader_->First(17).Text(4), "a");
+  EXPECT_EQ(*fReader->First(17).Text(4), "a");
 }
 
 TEST_F(TSmbiosReaderTest, ATypeThatIsNotThereSaysSo) {
   Read(Structure(4, "\1", {"only"}) + EndOfTable());
   EXPECT_THAT(TextsOf(17), IsEmpty());
-  EXPECT_EQ(reader_->WhyNone(17).fCode, "not-given");
-  EXPECT_EQ(reader_->WhyNone(17).fReason, "the SMBIOS tables hold no structure of type 17 (Memory Device)");
-  EXPECT_EQ(reader_->First(1).Text(4).Why().fReason, "the SMBIOS tables hold no structure of type 1 (System Information)");
+  EXPECT_EQ(fReader->WhyNone(17).fCode, "not-given");
+  EXPECT_EQ(fReader->WhyNone(17).fReason, "the SMBIOS tables hold no structure of type 17 (Memory Device)");
+  EXPECT_EQ(fReader->First(1).Text(4).Why().fReason, "the SMBIOS tables hold no structure of type 1 (System Information)");
 }
 
 TEST_F(TSmbiosReaderTest, ManyStructuresAreAllRead) {
@@ -72,63 +73,63 @@ TEST_F(TSmbiosReaderTest, ManyStructuresAreAllRead) {
 
 TEST_F(TSmbiosReaderTest, ALargeStructureIsRead) {
   Read(Structure(1, "\1", {std::string(60000, 'x')}) + EndOfTable());
-  EXPECT_EQ(*reader_->First(1).Text(4), std::string(60000, 'x'));
+  EXPECT_EQ(*fReader->First(1).Text(4), std::string(60000, 'x'));
   Read(Structure(1, "\1", {std::string(70000, 'x')}) + EndOfTable());
-  EXPECT_EQ(reader_->First(1).Text(4).Why().fCode, "unexpected-form") << "cut, so that the text has no end";
+  EXPECT_EQ(fReader->First(1).Text(4).Why().fCode, "unexpected-form") << "cut, so that the text has no end";
 }
 
 TEST_F(TSmbiosReaderTest, ATableFileThatCannotBeReadSaysWhy) {
-  ReadFrom(dir_.Path("nothing"));
-  EXPECT_EQ(reader_->WhyNone(1).fCode, "unreadable");
-  EXPECT_EQ(reader_->WhyNone(1).fReason, "the SMBIOS table file " + dir_.Path("nothing") + " does not exist");
-  EXPECT_THAT(reader_->All(17), IsEmpty());
-  EXPECT_EQ(reader_->First(1).Byte(4).Why().fReason, reader_->WhyNone(1).fReason);
+  ReadFrom(fDir.Path("nothing"));
+  EXPECT_EQ(fReader->WhyNone(1).fCode, "unreadable");
+  EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file " + fDir.Path("nothing") + " does not exist");
+  EXPECT_THAT(fReader->All(17), IsEmpty());
+  EXPECT_EQ(fReader->First(1).Byte(4).Why().fReason, fReader->WhyNone(1).fReason);
 
-  ReadFrom(dir_.Path());
-  EXPECT_EQ(reader_->WhyNone(1).fReason, "the SMBIOS table file " + dir_.Path() + " holds no SMBIOS table");
+  ReadFrom(fDir.Path());
+  EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file " + fDir.Path() + " holds no SMBIOS table");
   Read("");
-  EXPECT_EQ(reader_->WhyNone(1).fReason, "the SMBIOS table file " + dir_.Path("table") + " holds no SMBIOS table");
+  EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file " + fDir.Path("table") + " holds no SMBIOS table");
 }
 
 TEST_F(TSmbiosReaderTest, ATableFileThatCannotBeReadIsNotTakenForOneWithoutATable) {
   ReadFrom("/proc/self/mem");
-  EXPECT_EQ(reader_->WhyNone(1).fCode, "unreadable");
-  EXPECT_EQ(reader_->WhyNone(1).fReason, "the SMBIOS table file /proc/self/mem cannot be read: Input/output error");
+  EXPECT_EQ(fReader->WhyNone(1).fCode, "unreadable");
+  EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file /proc/self/mem cannot be read: Input/output error");
 
   Read(EndOfTable());  // the library is loaded from now on
   TSharedLibrary const library(::dlopen("libsmbios.so", RTLD_NOW));
   ASSERT_TRUE(library) << ::dlerror();
-  WriteFile(dir_.Path("other"), EndOfTable());
+  WriteFile(fDir.Path("other"), EndOfTable());
   rlimit limit;
   ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &limit), 0);
   rlimit const none{0, limit.rlim_max};
   ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &none), 0);
-  ReadFrom(dir_.Path("other"));
+  ReadFrom(fDir.Path("other"));
   ::setrlimit(RLIMIT_NOFILE, &limit);
-  EXPECT_EQ(reader_->WhyNone(1).fCode, "unreadable");
-  EXPECT_EQ(reader_->WhyNone(1).fReason, "the SMBIOS table file " + dir_.Path("other") + " cannot be read: Too many open files");
+  EXPECT_EQ(fReader->WhyNone(1).fCode, "unreadable");
+  EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file " + fDir.Path("other") + " cannot be read: Too many open files");
 }
 
 TEST_F(TSmbiosReaderTest, TheSourceTellsAFile) {
   Read(EndOfTable());
-  EXPECT_EQ(reader_->SourceOf(17), "SMBIOS type 17 (file)");
+  EXPECT_EQ(fReader->SourceOf(17), "SMBIOS type 17 (file)");
   ReadFrom("");
-  EXPECT_EQ(reader_->SourceOf(17), "SMBIOS type 17");
+  EXPECT_EQ(fReader->SourceOf(17), "SMBIOS type 17");
 }
 
 TEST_F(TSmbiosReaderTest, TheRealTablesHaveTheirStructures) {
   for (std::string const& name : kRealTables) {
     SCOPED_TRACE(name);
     ReadFrom(RealTablePath(name));
-    EXPECT_EQ(reader_->All(0).size(), 1u);
-    EXPECT_EQ(reader_->All(1).size(), 1u);
-    EXPECT_EQ(reader_->All(3).size(), 1u);
-    EXPECT_EQ(reader_->All(4).size(), 1u);
-    EXPECT_EQ(reader_->All(17).size(), 1u);
+    EXPECT_EQ(fReader->All(0).size(), 1u);
+    EXPECT_EQ(fReader->All(1).size(), 1u);
+    EXPECT_EQ(fReader->All(3).size(), 1u);
+    EXPECT_EQ(fReader->All(4).size(), 1u);
+    EXPECT_EQ(fReader->All(17).size(), 1u);
   }
   ReadFrom(SamplePath());
-  EXPECT_EQ(reader_->All(4).size(), 2u);
-  EXPECT_EQ(reader_->All(17).size(), 8u);
+  EXPECT_EQ(fReader->All(4).size(), 2u);
+  EXPECT_EQ(fReader->All(17).size(), 8u);
 }
 
 // ---- With a stand-in, which is loaded first and bears the library's name ----
@@ -136,19 +137,19 @@ TEST_F(TSmbiosReaderTest, TheRealTablesHaveTheirStructures) {
 class FakeSmbiosTest : public testing::Test {
 protected:
   void Load(char const* library, char const* behaviour) {
-    reader_.reset();
-    library_.reset(::dlopen(library, RTLD_NOW));
-    ASSERT_TRUE(library_) << ::dlerror();
-    guard_.reset();
-    guard_ = std::make_unique<TEnvironmentGuard>("FAKE_SMBIOS", behaviour);
-    reader_ = std::make_unique<TSmbiosReader>();
+    fReader.reset();
+    fLibrary.reset(::dlopen(library, RTLD_NOW));
+    ASSERT_TRUE(fLibrary) << ::dlerror();
+    fGuard.reset();
+    fGuard = std::make_unique<TEnvironmentGuard>("FAKE_SMBIOS", behaviour);
+    fReader = std::make_unique<TSmbiosReader>();
   }
-  int Closed() { return FunctionOf<int()>(library_.get(), "FakeSmbiosClosed")(); }
+  int Closed() { return FunctionOf<int()>(fLibrary.get(), "FakeSmbiosClosed")(); }
 
-  TEnvironmentGuard const noFile_{"ZEP_SMBIOS_TABLE", nullptr};
-  TSharedLibrary library_;
-  std::unique_ptr<TEnvironmentGuard> guard_;
-  std::unique_ptr<TSmbiosReader> reader_;
+  TEnvironmentGuard const fNoFile{"ZEP_SMBIOS_TABLE", nullptr};
+  TSharedLibrary fLibrary;
+  std::unique_ptr<TEnvironmentGuard> fGuard;
+  std::unique_ptr<TSmbiosReader> fReader;
 };
 
 TEST_F(FakeSmbiosTest, TheLibrarysStatusTellsWhy) {
@@ -165,43 +166,43 @@ TEST_F(FakeSmbiosTest, TheLibrarysStatusTellsWhy) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.behaviour);
     Load(FAKE_SMBIOS, row.behaviour);
-    EXPECT_EQ(reader_->WhyNone(1).fCode, row.code);
-    EXPECT_EQ(reader_->WhyNone(1).fReason, row.reason);
-    EXPECT_EQ(reader_->First(1).Text(5).Why().fCode, row.code);
-    EXPECT_TRUE(reader_->All(1).empty());
+    EXPECT_EQ(fReader->WhyNone(1).fCode, row.code);
+    EXPECT_EQ(fReader->WhyNone(1).fReason, row.reason);
+    EXPECT_EQ(fReader->First(1).Text(5).Why().fCode, row.code);
+    EXPECT_TRUE(fReader->All(1).empty());
   }
 }
 
 TEST_F(FakeSmbiosTest, WithoutGetNextTheFirstStructureIsAll) {
   Load(FAKE_SMBIOS_WITHOUT_NEXT, "works");
-  ASSERT_EQ(reader_->All(1).size(), 1u);
-  EXPECT_EQ(*reader_->All(1)[0].Text(5), "first");
+  ASSERT_EQ(fReader->All(1).size(), 1u);
+  EXPECT_EQ(*fReader->All(1)[0].Text(5), "first");
 }
 
 TEST_F(FakeSmbiosTest, WithGetNextTheOthersFollow) {
   Load(FAKE_SMBIOS, "works");
-  ASSERT_EQ(reader_->All(1).size(), 3u);
-  EXPECT_EQ(reader_->All(1).size(), 1u) << "the stand-in has handed out both";
+  ASSERT_EQ(fReader->All(1).size(), 3u);
+  EXPECT_EQ(fReader->All(1).size(), 1u) << "the stand-in has handed out both";
 }
 
 TEST_F(FakeSmbiosTest, NoLengthOfTheLibraryIsTrustedBeyondTheBuffer) {
   Load(FAKE_SMBIOS, "lies about the length");
-  EXPECT_EQ(*reader_->First(1).Text(5), "first");
+  EXPECT_EQ(*fReader->First(1).Text(5), "first");
   Load(FAKE_SMBIOS, "says no length");
-  EXPECT_EQ(reader_->First(1).Text(5).Why().fCode, "not-given");
+  EXPECT_EQ(fReader->First(1).Text(5).Why().fCode, "not-given");
   Load(FAKE_SMBIOS, "says a negative length");
-  EXPECT_EQ(reader_->First(1).Text(5).Why().fCode, "not-given");
+  EXPECT_EQ(fReader->First(1).Text(5).Why().fCode, "not-given");
 }
 
 TEST_F(FakeSmbiosTest, ALibraryThatNeverEndsIsLeft) {
   Load(FAKE_SMBIOS, "never ends");
-  EXPECT_EQ(reader_->All(1).size(), 4096u);
+  EXPECT_EQ(fReader->All(1).size(), 4096u);
 }
 
 TEST_F(FakeSmbiosTest, TheTablesAreClosed) {
   Load(FAKE_SMBIOS, "works");
   int const before = Closed();
-  reader_.reset();
+  fReader.reset();
   EXPECT_EQ(Closed(), before + 1);
 }
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "providers/host/TSmbiosStructure.h"
 
 #include "tests/providers/host/Structures.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Large namespaces: 1,600 classes nine deep, 10,000 instances, and that a lookup does not cost more in a larger one.
 
 #include "Collect.h"
@@ -56,23 +58,23 @@ double SecondsOf(TAction const& action) {
 class TLargeNamespace {
 public:
   explicit TLargeNamespace(int count) {
-    for (int i = 0; i < count; ++i) ns_->CreateClass(nullptr, NumberedName("X_Class", i), kNone);
-    ns_->DefineClass("X_Item").Key("Id", "uint32");
-    for (int i = 0; i < count; ++i) paths_.push_back(ns_->AddInstance("X_Item", {{"Id", i}})->GetPath(kNone));
+    for (int i = 0; i < count; ++i) fNs->CreateClass(nullptr, NumberedName("X_Class", i), kNone);
+    fNs->DefineClass("X_Item").Key("Id", "uint32");
+    for (int i = 0; i < count; ++i) fPaths.push_back(fNs->AddInstance("X_Item", {{"Id", i}})->GetPath(kNone));
   }
 
   // A thousand lookups of twenty classes and instances that lie spread over the whole namespace.
   void LookUp() const {
     for (std::size_t i = 0; i < 1000; ++i) {
-      std::size_t const position = i % 20 * paths_.size() / 20;
-      ASSERT_TRUE(ns_->GetClass(NumberedName("X_Class", static_cast<int>(position)), kNone));
-      ASSERT_TRUE(ns_->GetInstance(paths_[position], kNone));
+      std::size_t const position = i % 20 * fPaths.size() / 20;
+      ASSERT_TRUE(fNs->GetClass(NumberedName("X_Class", static_cast<int>(position)), kNone));
+      ASSERT_TRUE(fNs->GetInstance(fPaths[position], kNone));
     }
   }
 
 private:
-  boost::shared_ptr<TMemoryNamespace> const ns_ = NewNamespace();
-  std::vector<TCIMReference> paths_;
+  boost::shared_ptr<TMemoryNamespace> const fNs = NewNamespace();
+  std::vector<TCIMReference> fPaths;
 };
 
 TEST(ManyElementsTest, LookupInAHundredTimesLargerNamespaceDoesNotCostTenTimesAsMuch) {

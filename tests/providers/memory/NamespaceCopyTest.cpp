@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // That the interfaces tell enough: a copy that is made through them alone equals its source.
 
 #include "Collect.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryClassBuilder.h"
 
 #include "Collect.h"
@@ -18,11 +19,11 @@ protected:
     return text;
   }
 
-  boost::shared_ptr<TMemoryNamespace> const ns_ = NewNamespace();
+  boost::shared_ptr<TMemoryNamespace> const fNs = NewNamespace();
 };
 
 TEST_F(TMemoryClassBuilderTest, DescribesPropertiesInTheirOrder) {
-  auto const cls = ns_->DefineClass("X_Disk")
+  auto const cls = fNs->DefineClass("X_Disk")
                        .Key("Id", "uint32")
                        .Property("Name", "string")
                        .Property("Sectors", "uint16", 512)
@@ -39,8 +40,8 @@ TEST_F(TMemoryClassBuilderTest, DescribesPropertiesInTheirOrder) {
 }
 
 TEST_F(TMemoryClassBuilderTest, DescribesReferencesToClassesOneselfIncluded) {
-  auto const disk = ns_->DefineClass("X_Disk").Class();
-  auto const link = ns_->DefineClass("X_Link").Association().KeyReference("Disk", "X_Disk").Reference("Other", "x_link").Class();
+  auto const disk = fNs->DefineClass("X_Disk").Class();
+  auto const link = fNs->DefineClass("X_Link").Association().KeyReference("Disk", "X_Disk").Reference("Other", "x_link").Class();
   EXPECT_TRUE(link->GetClassFlag(kNone));
   EXPECT_TRUE(link->GetPropertyDecl("Disk", kNone)->IsKey(kNone));
   EXPECT_TRUE(link->GetPropertyDecl("Disk", kNone)->GetDefaultValue(kNone).IsReference());
@@ -50,7 +51,7 @@ TEST_F(TMemoryClassBuilderTest, DescribesReferencesToClassesOneselfIncluded) {
 }
 
 TEST_F(TMemoryClassBuilderTest, DescribesStaticProperties) {
-  auto const cls = ns_->DefineClass("X_Disk").Static("Count", "uint16", 3).Class();
+  auto const cls = fNs->DefineClass("X_Disk").Static("Count", "uint16", 3).Class();
   auto const count = All(*cls, &ICIMClass::EnumerateStaticProperties).front();
   EXPECT_EQ(count->GetName(kNone), "Count");
   EXPECT_EQ(count->GetValue(kNone).GetType(), TType::kCIMTypeUint16);
@@ -59,7 +60,7 @@ TEST_F(TMemoryClassBuilderTest, DescribesStaticProperties) {
 }
 
 TEST_F(TMemoryClassBuilderTest, DescribesMethodsAndTheirParameters) {
-  auto const cls = ns_->DefineClass("X_Disk")
+  auto const cls = fNs->DefineClass("X_Disk")
                        .Method("Reset", "uint32")
                        .In("Force", "boolean")
                        .Out("Log", "string[8]")
@@ -78,8 +79,8 @@ TEST_F(TMemoryClassBuilderTest, DescribesMethodsAndTheirParameters) {
 }
 
 TEST_F(TMemoryClassBuilderTest, QualifierIsWrittenOnWhatWasDescribedLast) {
-  ns_->DefineClass("X_Device").Property("State", "uint16");
-  auto const cls = ns_->DefineClass("X_Disk", "X_Device")
+  fNs->DefineClass("X_Device").Property("State", "uint16");
+  auto const cls = fNs->DefineClass("X_Disk", "X_Device")
                        .Abstract()
                        .Description("A disk.")
                        .Property("state", "uint16")
@@ -104,7 +105,7 @@ TEST_F(TMemoryClassBuilderTest, QualifierIsWrittenOnWhatWasDescribedLast) {
 }
 
 TEST_F(TMemoryClassBuilderTest, QualifierHasItsDeclaredFlavor) {
-  auto const cls = ns_->DefineClass("X_Disk").Abstract().Description("A disk.").Class();
+  auto const cls = fNs->DefineClass("X_Disk").Abstract().Description("A disk.").Class();
   EXPECT_EQ(cls->GetQualifier("Abstract", kNone)->GetFlavor(kNone), ICIMQualifierDecl::kFlavorEnableOverride);
   EXPECT_EQ(cls->GetQualifier("Description", kNone)->GetFlavor(kNone),
             ICIMQualifierDecl::kFlavorDefault | ICIMQualifierDecl::kFlavorTranslatable);
@@ -127,7 +128,7 @@ TEST_F(TMemoryClassBuilderTest, RefusalIsNamedInTheLogAndWhatWasDescribedStays) 
       {[](auto& cls) { cls.Qualifier("Huh", true); }, kZEPStatusNotFound, "X_Disk.[Huh] refused: kZEPStatusNotFound"},
       {[](auto& cls) { cls.Qualifier("Units", 5); }, kZEPStatusTypeMismatch, "X_Disk.[Units] refused: kZEPStatusTypeMismatch"},
   };
-  auto builder = ns_->DefineClass("X_Disk").Key("Id", "uint32");
+  auto builder = fNs->DefineClass("X_Disk").Key("Id", "uint32");
   for (auto const& row : rows) {
     SCOPED_TRACE(row.message);
     std::vector<std::string> errors;

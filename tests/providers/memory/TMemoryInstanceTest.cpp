@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryInstance.h"
 
 #include "Collect.h"
@@ -8,36 +9,36 @@ namespace {
 class TMemoryInstanceTest : public testing::Test {
 protected:
   TMemoryInstanceTest() {
-    ns_->DefineClass("X_Device").Key("Id", "uint32").Property("Name", "string", "unnamed");
-    ns_->DefineClass("X_Disk", "X_Device")
+    fNs->DefineClass("X_Device").Key("Id", "uint32").Property("Name", "string", "unnamed");
+    fNs->DefineClass("X_Disk", "X_Device")
         .Property("Sizes", "uint16[4]")
         .Property("name", "string", "disk")
         .Property("Tail", "real64");
-    ns_->DefineClass("X_Ssd", "X_Disk").Property("Cells", "uint8").Property("Letter", "char16");
-    disk_ = boost::dynamic_pointer_cast<TMemoryInstance>(ns_->GetClass("X_Disk", kNone)->CreateInstance(kNone));
+    fNs->DefineClass("X_Ssd", "X_Disk").Property("Cells", "uint8").Property("Letter", "char16");
+    fDisk = boost::dynamic_pointer_cast<TMemoryInstance>(fNs->GetClass("X_Disk", kNone)->CreateInstance(kNone));
   }
 
-  boost::shared_ptr<TMemoryNamespace> const ns_ = NewNamespace();
-  boost::shared_ptr<TMemoryInstance> disk_;
+  boost::shared_ptr<TMemoryNamespace> const fNs = NewNamespace();
+  boost::shared_ptr<TMemoryInstance> fDisk;
 };
 
 TEST_F(TMemoryInstanceTest, PropertiesComeFromTheTopClassDownAndOverridesInTheirFirstPlace) {
-  EXPECT_THAT(Names(*disk_, &ICIMInstance::EnumerateProperties), ElementsAre("Id", "name", "Sizes", "Tail"));
-  EXPECT_EQ(VisitsUntilSecond(*disk_, &ICIMInstance::EnumerateProperties), 2);
-  auto const ssd = ns_->GetClass("X_Ssd", kNone)->CreateInstance(kNone);
+  EXPECT_THAT(Names(*fDisk, &ICIMInstance::EnumerateProperties), ElementsAre("Id", "name", "Sizes", "Tail"));
+  EXPECT_EQ(VisitsUntilSecond(*fDisk, &ICIMInstance::EnumerateProperties), 2);
+  auto const ssd = fNs->GetClass("X_Ssd", kNone)->CreateInstance(kNone);
   EXPECT_THAT(Names(*ssd, &ICIMInstance::EnumerateProperties), ElementsAre("Id", "name", "Sizes", "Tail", "Cells", "Letter"));
 }
 
 TEST_F(TMemoryInstanceTest, PropertyIsFoundInAnyCaseWithItsNearestDeclaration) {
-  auto const name = disk_->GetProperty("NAME", kNone);
+  auto const name = fDisk->GetProperty("NAME", kNone);
   EXPECT_EQ(name->GetName(kNone), "name");
-  EXPECT_EQ(name->GetDeclaration(kNone), ns_->GetClass("X_Disk", kNone)->GetPropertyDecl("Name", kNone));
+  EXPECT_EQ(name->GetDeclaration(kNone), fNs->GetClass("X_Disk", kNone)->GetPropertyDecl("Name", kNone));
   EXPECT_EQ(name->GetValue(kNone).ToString(), "disk");
-  EXPECT_FALSE(disk_->GetProperty("Cells", kNone));
+  EXPECT_FALSE(fDisk->GetProperty("Cells", kNone));
 }
 
 TEST_F(TMemoryInstanceTest, PropertyTakesItsDeclaredTypeOnly) {
-  auto const id = disk_->GetProperty("Id", kNone);
+  auto const id = fDisk->GetProperty("Id", kNone);
   id->SetValue(5u, kNone);
   TCIMValue const refused[] = {TCIMValue(5), TCIMValue("5"), TCIMValue(), NullOf("sint32"), NullOf("uint32[]")};
   for (TCIMValue const& value : refused) {
@@ -50,7 +51,7 @@ TEST_F(TMemoryInstanceTest, PropertyTakesItsDeclaredTypeOnly) {
 }
 
 TEST_F(TMemoryInstanceTest, PropertyTakesANewValueOfEachKind) {
-  TCIMReference one(ns_, "ns:X_Disk.Id=\"1\"", kNone), two(ns_, "ns:X_Disk.Id=\"2\"", kNone);
+  TCIMReference one(fNs, "ns:X_Disk.Id=\"1\"", kNone), two(fNs, "ns:X_Disk.Id=\"2\"", kNone);
   struct {
     char const* type;
     TCIMValue first, second;
@@ -66,7 +67,7 @@ TEST_F(TMemoryInstanceTest, PropertyTakesANewValueOfEachKind) {
   };
   for (auto const& row : rows) {
     SCOPED_TRACE(row.type);
-    auto const cls = ns_->DefineClass("X_Of" + std::to_string(&row - rows)).Property("P", row.type).Class();
+    auto const cls = fNs->DefineClass("X_Of" + std::to_string(&row - rows)).Property("P", row.type).Class();
     auto const property = cls->CreateInstance(kNone)->GetProperty("P", kNone);
     property->SetValue(row.first, kNone);
     EXPECT_EQ(property->GetValue(kNone).ToString(), row.first.ToString());
@@ -79,60 +80,60 @@ TEST_F(TMemoryInstanceTest, PropertyTakesANewValueOfEachKind) {
 }
 
 TEST_F(TMemoryInstanceTest, ValueOfAPropertyIsACopy) {
-  disk_->Set("Sizes", TCIMValue(TType::kCIMTypeUint16, 0, {TCIMValue(static_cast<unsigned short>(1))}));
-  TCIMValue value = disk_->Get("Sizes");
+  fDisk->Set("Sizes", TCIMValue(TType::kCIMTypeUint16, 0, {TCIMValue(static_cast<unsigned short>(1))}));
+  TCIMValue value = fDisk->Get("Sizes");
   static_cast<std::vector<TCIMValue>&>(value).clear();
-  EXPECT_EQ(disk_->Get("Sizes").ToString(), "{ 1 }");
+  EXPECT_EQ(fDisk->Get("Sizes").ToString(), "{ 1 }");
 }
 
 TEST_F(TMemoryInstanceTest, PropertyOutlivesItsInstance) {
-  auto const name = disk_->GetProperty("Name", kNone);
-  disk_.reset();
+  auto const name = fDisk->GetProperty("Name", kNone);
+  fDisk.reset();
   EXPECT_EQ(name->GetValue(kNone).ToString(), "disk");
   EXPECT_EQ(name->GetName(kNone), "name");
 }
 
 TEST_F(TMemoryInstanceTest, KeysAreFixedOnceTheInstanceIsCommitted) {
-  disk_->Set("Id", 1);
-  disk_->Set("Id", 2);
-  ns_->GetClass("X_Disk", kNone)->CommitInstance(disk_, kNone);
-  EXPECT_STATUS(disk_->GetProperty("Id", kNone)->SetValue(3u, kNone), kZEPStatusInvalidOpSequence);
-  EXPECT_STATUS(disk_->Set("Id", 3), kZEPStatusInvalidOpSequence);
-  EXPECT_EQ(disk_->Get("Id").ToString(), "2");
-  EXPECT_NO_THROW(disk_->Set("Name", "renamed"));
+  fDisk->Set("Id", 1);
+  fDisk->Set("Id", 2);
+  fNs->GetClass("X_Disk", kNone)->CommitInstance(fDisk, kNone);
+  EXPECT_STATUS(fDisk->GetProperty("Id", kNone)->SetValue(3u, kNone), kZEPStatusInvalidOpSequence);
+  EXPECT_STATUS(fDisk->Set("Id", 3), kZEPStatusInvalidOpSequence);
+  EXPECT_EQ(fDisk->Get("Id").ToString(), "2");
+  EXPECT_NO_THROW(fDisk->Set("Name", "renamed"));
 }
 
 TEST_F(TMemoryInstanceTest, PathHasTheClassAndTheKeysThatAreNotNull) {
-  EXPECT_EQ(disk_->GetPath(kNone).GetPath(), "X_Disk");
-  disk_->Set("Id", 7);
-  TCIMReference const path = disk_->GetPath(kNone);
+  EXPECT_EQ(fDisk->GetPath(kNone).GetPath(), "X_Disk");
+  fDisk->Set("Id", 7);
+  TCIMReference const path = fDisk->GetPath(kNone);
   EXPECT_EQ(path.GetPath(), "X_Disk.Id=\"7\"");
-  EXPECT_EQ(path.GetClass(), ns_->GetClass("X_Disk", kNone));
-  EXPECT_EQ(path.GetNamespace(), ns_);
+  EXPECT_EQ(path.GetClass(), fNs->GetClass("X_Disk", kNone));
+  EXPECT_EQ(path.GetNamespace(), fNs);
 }
 
 TEST_F(TMemoryInstanceTest, SetTakesPlainLiterals) {
-  disk_->Set("ID", 5);
-  EXPECT_EQ(disk_->Get("Id").GetType(), TType::kCIMTypeUint32);
-  EXPECT_EQ(disk_->Get("iD").ToString(), "5");
-  disk_->Set("Name", TCIMValue());
-  EXPECT_TRUE(disk_->Get("Name").IsNull());
-  EXPECT_EQ(disk_->Get("Name").GetType(), TType::kCIMTypeString);
-  disk_->Set("Sizes", TCIMValue(TType::kCIMTypeUint16, 0, {TCIMValue(static_cast<unsigned short>(1))}));
-  EXPECT_EQ(disk_->Get("Sizes").GetMaxArraySize(), 4u);
+  fDisk->Set("ID", 5);
+  EXPECT_EQ(fDisk->Get("Id").GetType(), TType::kCIMTypeUint32);
+  EXPECT_EQ(fDisk->Get("iD").ToString(), "5");
+  fDisk->Set("Name", TCIMValue());
+  EXPECT_TRUE(fDisk->Get("Name").IsNull());
+  EXPECT_EQ(fDisk->Get("Name").GetType(), TType::kCIMTypeString);
+  fDisk->Set("Sizes", TCIMValue(TType::kCIMTypeUint16, 0, {TCIMValue(static_cast<unsigned short>(1))}));
+  EXPECT_EQ(fDisk->Get("Sizes").GetMaxArraySize(), 4u);
 
-  EXPECT_STATUS(disk_->Set("Id", -1), kZEPStatusTypeMismatch);
-  EXPECT_STATUS(disk_->Set("Id", "5"), kZEPStatusTypeMismatch);
-  EXPECT_STATUS(disk_->Set("Cells", 5), kZEPStatusNotFound);
-  EXPECT_STATUS(disk_->Get("Cells"), kZEPStatusNotFound);
+  EXPECT_STATUS(fDisk->Set("Id", -1), kZEPStatusTypeMismatch);
+  EXPECT_STATUS(fDisk->Set("Id", "5"), kZEPStatusTypeMismatch);
+  EXPECT_STATUS(fDisk->Set("Cells", 5), kZEPStatusNotFound);
+  EXPECT_STATUS(fDisk->Get("Cells"), kZEPStatusNotFound);
 }
 
 TEST_F(TMemoryInstanceTest, ReferenceToItselfNamesIt) {
-  disk_->Set("Id", 5);
-  TCIMValue const reference = disk_->GetReference();
+  fDisk->Set("Id", 5);
+  TCIMValue const reference = fDisk->GetReference();
   EXPECT_TRUE(reference.IsReference());
   EXPECT_EQ(reference.ToString(), "X_Disk.Id=\"5\"");
-  EXPECT_EQ(reference.GetReferencedClass(), ns_->GetClass("X_Disk", kNone));
+  EXPECT_EQ(reference.GetReferencedClass(), fNs->GetClass("X_Disk", kNone));
 }
 
 }  // namespace

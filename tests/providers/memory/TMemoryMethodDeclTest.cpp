@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryMethodDecl.h"
 
 #include "Collect.h"
@@ -7,9 +8,9 @@ namespace {
 
 class TMemoryMethodDeclTest : public testing::Test {
 protected:
-  boost::shared_ptr<TMemoryNamespace> const ns_ = NewNamespace();
-  boost::shared_ptr<ICIMMethodDecl> const method_ =
-      ns_->CreateClass(nullptr, "X_Disk", kNone)->AddMethodDecl("Reset", TType::kCIMTypeUint32, kNone);
+  boost::shared_ptr<TMemoryNamespace> const fNs = NewNamespace();
+  boost::shared_ptr<ICIMMethodDecl> const fMethod =
+      fNs->CreateClass(nullptr, "X_Disk", kNone)->AddMethodDecl("Reset", TType::kCIMTypeUint32, kNone);
 };
 
 TEST_F(TMemoryMethodDeclTest, ParametersTellWhatTheyWereAddedWith) {
@@ -22,20 +23,20 @@ TEST_F(TMemoryMethodDeclTest, ParametersTellWhatTheyWereAddedWith) {
   for (auto const& row : rows) {
     SCOPED_TRACE(row.name);
     TMemoryType const type(row.type);
-    auto const parameter = method_->AddParameterDecl(row.name, type.GetType(), type.GetMaxArraySize(), row.className, kNone);
+    auto const parameter = fMethod->AddParameterDecl(row.name, type.GetType(), type.GetMaxArraySize(), row.className, kNone);
     EXPECT_EQ(parameter->GetName(kNone), row.name);
     EXPECT_EQ(parameter->GetType(kNone), type.GetType());
     EXPECT_EQ(parameter->GetMaxArraySize(kNone), type.GetMaxArraySize());
     EXPECT_EQ(parameter->GetReferencedClassName(kNone), row.className);
-    EXPECT_EQ(parameter->GetMethod(kNone).lock(), method_);
+    EXPECT_EQ(parameter->GetMethod(kNone).lock(), fMethod);
   }
-  EXPECT_THAT(Names(*method_, &ICIMMethodDecl::EnumerateParameterDecls),
+  EXPECT_THAT(Names(*fMethod, &ICIMMethodDecl::EnumerateParameterDecls),
               ElementsAre("Zone", "Force", "Bytes", "To", "All", "Any"));
-  EXPECT_EQ(VisitsUntilSecond(*method_, &ICIMMethodDecl::EnumerateParameterDecls), 2);
+  EXPECT_EQ(VisitsUntilSecond(*fMethod, &ICIMMethodDecl::EnumerateParameterDecls), 2);
 }
 
 TEST_F(TMemoryMethodDeclTest, ParameterIsRefusedWithItsReason) {
-  method_->AddParameterDecl("Zone", TType::kCIMTypeString, 0, "", kNone);
+  fMethod->AddParameterDecl("Zone", TType::kCIMTypeString, 0, "", kNone);
   struct {
     char const* name;
     TType type;
@@ -52,9 +53,9 @@ TEST_F(TMemoryMethodDeclTest, ParameterIsRefusedWithItsReason) {
   };
   for (auto const& row : rows) {
     SCOPED_TRACE(row.name);
-    EXPECT_STATUS(method_->AddParameterDecl(row.name, row.type, row.bound, row.className, kNone), row.status);
+    EXPECT_STATUS(fMethod->AddParameterDecl(row.name, row.type, row.bound, row.className, kNone), row.status);
   }
-  EXPECT_THAT(Names(*method_, &ICIMMethodDecl::EnumerateParameterDecls), ElementsAre("Zone"));
+  EXPECT_THAT(Names(*fMethod, &ICIMMethodDecl::EnumerateParameterDecls), ElementsAre("Zone"));
 }
 
 }  // namespace

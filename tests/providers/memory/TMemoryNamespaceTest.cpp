@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryNamespace.h"
 
 #include "Collect.h"
@@ -177,23 +178,23 @@ TEST(TMemoryNamespaceTest, QualifierDeclarationIsRefusedWithItsReason) {
 class TMemoryNamespacePathTest : public testing::Test {
 protected:
   TMemoryNamespacePathTest() {
-    ns_->DefineClass("X_Device").Key("Id", "uint32").Key("Bus", "string").Property("Name", "string");
-    ns_->DefineClass("X_Disk", "X_Device").Property("Size", "uint64");
-    disk_ = ns_->AddInstance("X_Disk", {{"Id", 5}, {"Bus", "sata"}, {"Name", "sda"}});
-    device_ = ns_->AddInstance("X_Device", {{"Id", 6}, {"Bus", "sata"}});
+    fNs->DefineClass("X_Device").Key("Id", "uint32").Key("Bus", "string").Property("Name", "string");
+    fNs->DefineClass("X_Disk", "X_Device").Property("Size", "uint64");
+    fDisk = fNs->AddInstance("X_Disk", {{"Id", 5}, {"Bus", "sata"}, {"Name", "sda"}});
+    fDevice = fNs->AddInstance("X_Device", {{"Id", 6}, {"Bus", "sata"}});
   }
 
   boost::shared_ptr<ICIMInstance> Find(char const* path) {
-    return ns_->GetInstance(TCIMReference(ns_, std::string("ns:") + path, kNone), kNone);
+    return fNs->GetInstance(TCIMReference(fNs, std::string("ns:") + path, kNone), kNone);
   }
 
-  boost::shared_ptr<TMemoryNamespace> const ns_ = NewNamespace();
-  boost::shared_ptr<TMemoryInstance> disk_, device_;
+  boost::shared_ptr<TMemoryNamespace> const fNs = NewNamespace();
+  boost::shared_ptr<TMemoryInstance> fDisk, fDevice;
 };
 
 TEST_F(TMemoryNamespacePathTest, InstanceIsFoundUnderItsOwnClassAndAllItsKeys) {
-  EXPECT_EQ(disk_->GetPath(kNone).GetPath(), "X_Disk.Bus=\"sata\",Id=\"5\"");
-  EXPECT_EQ(ns_->GetInstance(disk_->GetPath(kNone), kNone), disk_);
+  EXPECT_EQ(fDisk->GetPath(kNone).GetPath(), "X_Disk.Bus=\"sata\",Id=\"5\"");
+  EXPECT_EQ(fNs->GetInstance(fDisk->GetPath(kNone), kNone), fDisk);
   struct {
     char const* path;
     bool finds;
@@ -210,18 +211,18 @@ TEST_F(TMemoryNamespacePathTest, InstanceIsFoundUnderItsOwnClassAndAllItsKeys) {
   };
   for (auto const& row : rows) {
     SCOPED_TRACE(row.path);
-    EXPECT_EQ(Find(row.path), row.finds ? disk_ : nullptr);
+    EXPECT_EQ(Find(row.path), row.finds ? fDisk : nullptr);
   }
 }
 
 TEST_F(TMemoryNamespacePathTest, SuperclassPathFindsInstancesOfTheSuperclassItselfOnly) {
-  EXPECT_EQ(Find("X_Device.Bus=\"sata\",Id=\"6\""), device_);
+  EXPECT_EQ(Find("X_Device.Bus=\"sata\",Id=\"6\""), fDevice);
   EXPECT_EQ(Find("X_Disk.Bus=\"sata\",Id=\"6\""), nullptr);
 }
 
 TEST_F(TMemoryNamespacePathTest, PathWithoutClassOrKeysFindsNothing) {
-  TCIMReference const empty(ns_, kNone);
-  EXPECT_FALSE(ns_->GetInstance(empty, kNone));
+  TCIMReference const empty(fNs, kNone);
+  EXPECT_FALSE(fNs->GetInstance(empty, kNone));
   EXPECT_FALSE(Find("X_Disk"));
 }
 
@@ -230,46 +231,46 @@ TEST_F(TMemoryNamespacePathTest, PathMadeInAnotherNamespaceFindsByNames) {
   other->DefineClass("x_disk").Key("ID", "uint32").Key("BUS", "string");
   other->DefineClass("X_Tape").Key("Id", "uint32");
   TCIMReference const path(other, "ns:X_Disk.Id=\"5\",Bus=\"sata\"", kNone);
-  EXPECT_EQ(ns_->GetInstance(path, kNone), disk_);
-  EXPECT_FALSE(ns_->GetInstance(TCIMReference(other, "ns:X_Tape.Id=\"5\"", kNone), kNone));
+  EXPECT_EQ(fNs->GetInstance(path, kNone), fDisk);
+  EXPECT_FALSE(fNs->GetInstance(TCIMReference(other, "ns:X_Tape.Id=\"5\"", kNone), kNone));
 }
 
 TEST_F(TMemoryNamespacePathTest, ReferenceResolvesToTheInstance) {
-  TCIMReference const path(ns_, "ns:X_Disk.Bus=\"sata\",Id=\"5\"", kNone);
-  EXPECT_EQ(path.GetCIMElement(false), disk_);
-  EXPECT_EQ(path.GetCIMElement(true), ns_->GetClass("X_Disk", kNone));
-  TCIMReference const missing(ns_, "ns:X_Disk.Bus=\"sata\",Id=\"7\"", kNone);
+  TCIMReference const path(fNs, "ns:X_Disk.Bus=\"sata\",Id=\"5\"", kNone);
+  EXPECT_EQ(path.GetCIMElement(false), fDisk);
+  EXPECT_EQ(path.GetCIMElement(true), fNs->GetClass("X_Disk", kNone));
+  TCIMReference const missing(fNs, "ns:X_Disk.Bus=\"sata\",Id=\"7\"", kNone);
   EXPECT_STATUS(missing.GetCIMElement(false), kZEPStatusNotFound);
 }
 
 TEST_F(TMemoryNamespacePathTest, InstanceThatIsNotCommittedIsNotFound) {
-  auto const instance = ns_->GetClass("X_Disk", kNone)->CreateInstance(kNone);
+  auto const instance = fNs->GetClass("X_Disk", kNone)->CreateInstance(kNone);
   instance->GetProperty("Id", kNone)->SetValue(9u, kNone);
   instance->GetProperty("Bus", kNone)->SetValue("sata", kNone);
-  EXPECT_FALSE(ns_->GetInstance(instance->GetPath(kNone), kNone));
+  EXPECT_FALSE(fNs->GetInstance(instance->GetPath(kNone), kNone));
 }
 
 TEST_F(TMemoryNamespacePathTest, KeyThatIsNullIsLeftOutOfThePath) {
-  auto const half = ns_->AddInstance("X_Disk", {{"Id", 8}});
+  auto const half = fNs->AddInstance("X_Disk", {{"Id", 8}});
   EXPECT_EQ(half->GetPath(kNone).GetPath(), "X_Disk.Id=\"8\"");
   EXPECT_EQ(Find("X_Disk.Id=\"8\""), half);
 
-  TCIMReference withNull(ns_, "ns:X_Disk.Id=\"8\"", kNone);
+  TCIMReference withNull(fNs, "ns:X_Disk.Id=\"8\"", kNone);
   withNull.AddKeyValue("Bus", NullOf("string"));
-  EXPECT_EQ(ns_->GetInstance(withNull, kNone), half);
+  EXPECT_EQ(fNs->GetInstance(withNull, kNone), half);
 }
 
 TEST_F(TMemoryNamespacePathTest, KeyValuesThatLookLikeTwoKeysStayApart) {
-  ns_->DefineClass("X_Pair").Key("A", "string").Key("B", "string");
-  auto const one = ns_->AddInstance("X_Pair", {{"A", "1\",B=\"2"}, {"B", "3"}});
-  auto const two = ns_->AddInstance("X_Pair", {{"A", "1"}, {"B", "2\",B=\"3"}});
-  auto const three = ns_->AddInstance("X_Pair", {{"A", std::string("1\0b=1:2", 7)}, {"B", ""}});
-  for (auto const& instance : {one, two, three}) EXPECT_EQ(ns_->GetInstance(instance->GetPath(kNone), kNone), instance);
+  fNs->DefineClass("X_Pair").Key("A", "string").Key("B", "string");
+  auto const one = fNs->AddInstance("X_Pair", {{"A", "1\",B=\"2"}, {"B", "3"}});
+  auto const two = fNs->AddInstance("X_Pair", {{"A", "1"}, {"B", "2\",B=\"3"}});
+  auto const three = fNs->AddInstance("X_Pair", {{"A", std::string("1\0b=1:2", 7)}, {"B", ""}});
+  for (auto const& instance : {one, two, three}) EXPECT_EQ(fNs->GetInstance(instance->GetPath(kNone), kNone), instance);
 }
 
 TEST_F(TMemoryNamespacePathTest, KeysOfEachKindAreFoundByValue) {
-  TCIMReference diskPath = disk_->GetPath(kNone);
-  TCIMReference devicePath = device_->GetPath(kNone);
+  TCIMReference diskPath = fDisk->GetPath(kNone);
+  TCIMReference devicePath = fDevice->GetPath(kNone);
   struct {
     char const* type;
     TCIMValue value, other;
@@ -287,36 +288,36 @@ TEST_F(TMemoryNamespacePathTest, KeysOfEachKindAreFoundByValue) {
   for (auto const& row : rows) {
     SCOPED_TRACE(row.type);
     std::string const name = std::string("X_By_") + row.type;
-    ns_->DefineClass(name).Key("K", row.type);
-    auto const instance = ns_->AddInstance(name, {{"K", row.value}});
-    auto const other = ns_->AddInstance(name, {{"K", row.other}});
-    EXPECT_EQ(ns_->GetInstance(instance->GetPath(kNone), kNone), instance);
-    EXPECT_EQ(ns_->GetInstance(other->GetPath(kNone), kNone), other);
-    EXPECT_STATUS(ns_->AddInstance(name, {{"K", row.value}}), kZEPStatusAlreadyExists);
+    fNs->DefineClass(name).Key("K", row.type);
+    auto const instance = fNs->AddInstance(name, {{"K", row.value}});
+    auto const other = fNs->AddInstance(name, {{"K", row.other}});
+    EXPECT_EQ(fNs->GetInstance(instance->GetPath(kNone), kNone), instance);
+    EXPECT_EQ(fNs->GetInstance(other->GetPath(kNone), kNone), other);
+    EXPECT_STATUS(fNs->AddInstance(name, {{"K", row.value}}), kZEPStatusAlreadyExists);
   }
 }
 
 TEST_F(TMemoryNamespacePathTest, Char16KeyIsNotFoundByAPathReadFromText) {
-  ns_->DefineClass("X_Drive").Key("Letter", "char16");
-  auto const drive = ns_->AddInstance("X_Drive", {{"Letter", TCIMChar16(67)}});
-  EXPECT_EQ(ns_->GetInstance(drive->GetPath(kNone), kNone), drive);
+  fNs->DefineClass("X_Drive").Key("Letter", "char16");
+  auto const drive = fNs->AddInstance("X_Drive", {{"Letter", TCIMChar16(67)}});
+  EXPECT_EQ(fNs->GetInstance(drive->GetPath(kNone), kNone), drive);
   EXPECT_FALSE(Find("X_Drive.Letter=\"67\""));  // a char16 that is read from text is NULL
 }
 
 TEST_F(TMemoryNamespacePathTest, DatetimesOfOneInstantInTwoZonesAreTwoKeys) {
-  ns_->DefineClass("X_Event").Key("Time", "datetime");
-  ns_->AddInstance("X_Event", {{"Time", TCIMDateTime("20070315140000.000000+060")}});
-  EXPECT_NO_THROW(ns_->AddInstance("X_Event", {{"Time", TCIMDateTime("20070315130000.000000+000")}}));
+  fNs->DefineClass("X_Event").Key("Time", "datetime");
+  fNs->AddInstance("X_Event", {{"Time", TCIMDateTime("20070315140000.000000+060")}});
+  EXPECT_NO_THROW(fNs->AddInstance("X_Event", {{"Time", TCIMDateTime("20070315130000.000000+000")}}));
 }
 
 TEST_F(TMemoryNamespacePathTest, ReferenceKeyIsComparedByItsNamesInAnyCase) {
-  ns_->DefineClass("X_Uses").Association().KeyReference("What", "X_Device");
-  auto const uses = ns_->AddInstance("X_Uses", {{"What", disk_->GetReference()}});
+  fNs->DefineClass("X_Uses").Association().KeyReference("What", "X_Device");
+  auto const uses = fNs->AddInstance("X_Uses", {{"What", fDisk->GetReference()}});
 
-  TCIMReference what(ns_, "ns:x_disk.ID=\"5\",BUS=\"sata\"", kNone);
-  TCIMReference path(ns_, "X_Uses", kNone);
+  TCIMReference what(fNs, "ns:x_disk.ID=\"5\",BUS=\"sata\"", kNone);
+  TCIMReference path(fNs, "X_Uses", kNone);
   path.AddKeyValue("what", TCIMValue(what));
-  EXPECT_EQ(ns_->GetInstance(path, kNone), uses);
+  EXPECT_EQ(fNs->GetInstance(path, kNone), uses);
 }
 
 // ---- Filling ----
@@ -393,28 +394,28 @@ TEST(TMemoryNamespaceTest, StandardQualifiersAreDeclaredOnceAndLeaveOthersAlone)
 class TMemoryNamespaceLifeTest : public testing::Test {
 protected:
   TMemoryNamespaceLifeTest() {
-    ns_->DefineClass("X_Node").Key("Id", "uint32").Reference("Next", "X_Node").Property("Others", "reference[]");
-    ns_->DefineClass("X_Leaf", "X_Node").Method("Cut", "uint32").In("Deep", "boolean");
-    node_ = ns_->AddInstance("X_Node", {{"Id", 1}});
-    class_ = ns_->GetClass("X_Node", kNone);
+    fNs->DefineClass("X_Node").Key("Id", "uint32").Reference("Next", "X_Node").Property("Others", "reference[]");
+    fNs->DefineClass("X_Leaf", "X_Node").Method("Cut", "uint32").In("Deep", "boolean");
+    fNode = fNs->AddInstance("X_Node", {{"Id", 1}});
+    fClass = fNs->GetClass("X_Node", kNone);
   }
 
-  boost::shared_ptr<TMemoryNamespace> ns_ = NewNamespace();
-  boost::shared_ptr<TMemoryInstance> node_;
-  boost::shared_ptr<ICIMClass> class_;
+  boost::shared_ptr<TMemoryNamespace> fNs = NewNamespace();
+  boost::shared_ptr<TMemoryInstance> fNode;
+  boost::shared_ptr<ICIMClass> fClass;
 };
 
 TEST_F(TMemoryNamespaceLifeTest, EverythingIsFreedWithTheNamespace) {
-  boost::weak_ptr<ICIMNamespace> const ns = ns_;
-  boost::weak_ptr<ICIMClass> const cls = class_;
-  boost::weak_ptr<ICIMClass> const leaf = ns_->GetClass("X_Leaf", kNone);
-  boost::weak_ptr<ICIMInstance> const instance = node_;
-  boost::weak_ptr<ICIMPropertyDecl const> const property = class_->GetPropertyDecl("Id", kNone);
-  boost::weak_ptr<ICIMQualifierDecl> const qualifier = ns_->GetQualifierDecl("Key", kNone);
-  class_.reset();
-  node_.reset();
+  boost::weak_ptr<ICIMNamespace> const ns = fNs;
+  boost::weak_ptr<ICIMClass> const cls = fClass;
+  boost::weak_ptr<ICIMClass> const leaf = fNs->GetClass("X_Leaf", kNone);
+  boost::weak_ptr<ICIMInstance> const instance = fNode;
+  boost::weak_ptr<ICIMPropertyDecl const> const property = fClass->GetPropertyDecl("Id", kNone);
+  boost::weak_ptr<ICIMQualifierDecl> const qualifier = fNs->GetQualifierDecl("Key", kNone);
+  fClass.reset();
+  fNode.reset();
   ASSERT_EQ(ns.use_count(), 1);
-  ns_.reset();
+  fNs.reset();
   EXPECT_TRUE(ns.expired());
   EXPECT_TRUE(cls.expired());
   EXPECT_TRUE(leaf.expired());
@@ -424,29 +425,29 @@ TEST_F(TMemoryNamespaceLifeTest, EverythingIsFreedWithTheNamespace) {
 }
 
 TEST_F(TMemoryNamespaceLifeTest, CirclesOfReferencesAreFreedToo) {
-  TCIMReference path = node_->GetPath(kNone);
+  TCIMReference path = fNode->GetPath(kNone);
   path.GetCIMElement(false);  // from now on it owns the instance
-  node_->Set("Next", path);
-  node_->Set("Others", TCIMValue(TType::kCIMTypeReference, 0, {TCIMValue(path)}));
+  fNode->Set("Next", path);
+  fNode->Set("Others", TCIMValue(TType::kCIMTypeReference, 0, {TCIMValue(path)}));
   path.Clear();
 
-  boost::weak_ptr<ICIMInstance> const instance = node_;
-  boost::weak_ptr<ICIMClass> const cls = class_;
-  class_.reset();
-  node_.reset();
-  ns_.reset();
+  boost::weak_ptr<ICIMInstance> const instance = fNode;
+  boost::weak_ptr<ICIMClass> const cls = fClass;
+  fClass.reset();
+  fNode.reset();
+  fNs.reset();
   EXPECT_TRUE(instance.expired());
   EXPECT_TRUE(cls.expired());
 }
 
 TEST_F(TMemoryNamespaceLifeTest, ClassThatOutlivesItsNamespaceIsEmpty) {
-  auto const leaf = ns_->GetClass("X_Leaf", kNone);
+  auto const leaf = fNs->GetClass("X_Leaf", kNone);
   auto const method = All(*leaf, &ICIMClass::EnumerateMethodDecls).front();
   auto const parameter = All(*method, &ICIMMethodDecl::EnumerateParameterDecls).front();
-  auto const declaration = class_->GetPropertyDecl("Id", kNone);
-  node_.reset();
-  class_.reset();
-  ns_.reset();
+  auto const declaration = fClass->GetPropertyDecl("Id", kNone);
+  fNode.reset();
+  fClass.reset();
+  fNs.reset();
 
   EXPECT_EQ(leaf->GetName(kNone), "X_Leaf");
   EXPECT_FALSE(leaf->IsRootClass(kNone));
@@ -462,20 +463,20 @@ TEST_F(TMemoryNamespaceLifeTest, ClassThatOutlivesItsNamespaceIsEmpty) {
 }
 
 TEST_F(TMemoryNamespaceLifeTest, InstanceThatOutlivesItsNamespaceKeepsItsValuesButForReferences) {
-  node_->Set("Next", node_->GetReference());
-  class_.reset();
-  ns_.reset();
-  EXPECT_EQ(node_->Get("Id").ToString(), "1");
-  EXPECT_TRUE(node_->Get("Next").IsNull());
-  EXPECT_THROW(node_->GetPath(kNone), boost::bad_weak_ptr);
+  fNode->Set("Next", fNode->GetReference());
+  fClass.reset();
+  fNs.reset();
+  EXPECT_EQ(fNode->Get("Id").ToString(), "1");
+  EXPECT_TRUE(fNode->Get("Next").IsNull());
+  EXPECT_THROW(fNode->GetPath(kNone), boost::bad_weak_ptr);
 }
 
 TEST_F(TMemoryNamespaceLifeTest, NamespaceMayGoWhileItIsEnumerated) {
-  ns_->AddInstance("X_Node", {{"Id", 2}});
+  fNs->AddInstance("X_Node", {{"Id", 2}});
   int visits = 0;
-  class_->EnumerateInstances(
+  fClass->EnumerateInstances(
       [&](boost::shared_ptr<ICIMInstance> const&) {
-        ns_.reset();
+        fNs.reset();
         return ++visits < 10;
       },
       kNone);

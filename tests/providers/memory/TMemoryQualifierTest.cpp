@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TMemoryQualifier.h"
 
 #include "Collect.h"
@@ -24,14 +25,14 @@ TEST(TMemoryQualifierDeclTest, TellsWhatItWasCreatedWith) {
 class TMemoryQualifierTest : public testing::TestWithParam<char const*> {
 protected:
   TMemoryQualifierTest() {
-    ns_->DefineClass("X_Disk").Property("Name", "string").Method("Reset", "uint32").In("Force", "boolean");
-    units_ = ns_->CreateQualifierDecl("Unit", NullOf("string"), ICIMQualifierDecl::kScopeAny, 0, kNone);
-    size_ = ns_->CreateQualifierDecl("Size", NullOf("uint32"), ICIMQualifierDecl::kScopeAny, 0, kNone);
-    element_ = Element(GetParam());
+    fNs->DefineClass("X_Disk").Property("Name", "string").Method("Reset", "uint32").In("Force", "boolean");
+    fUnits = fNs->CreateQualifierDecl("Unit", NullOf("string"), ICIMQualifierDecl::kScopeAny, 0, kNone);
+    fSize = fNs->CreateQualifierDecl("Size", NullOf("uint32"), ICIMQualifierDecl::kScopeAny, 0, kNone);
+    fElement = Element(GetParam());
   }
 
   boost::shared_ptr<ICIMNamedElement> Element(std::string const& kind) {
-    auto const cls = ns_->GetClass("X_Disk", kNone);
+    auto const cls = fNs->GetClass("X_Disk", kNone);
     auto const method = All(*cls, &ICIMClass::EnumerateMethodDecls).front();
     if (kind == "class") return cls;
     if (kind == "property") return All(*cls, &ICIMClass::EnumeratePropertyDecls).front();
@@ -40,49 +41,49 @@ protected:
   }
 
   std::vector<std::string> QualifierNames() {
-    std::vector<std::string> names = Names(*element_, &ICIMNamedElement::EnumerateQualifiers);
+    std::vector<std::string> names = Names(*fElement, &ICIMNamedElement::EnumerateQualifiers);
     if (!names.empty() && names.front() == "In") names.erase(names.begin());  // the builder's, on the parameter
     return names;
   }
 
-  boost::shared_ptr<TMemoryNamespace> const ns_ = NewNamespace();
-  boost::shared_ptr<ICIMQualifierDecl> units_, size_;
-  boost::shared_ptr<ICIMNamedElement> element_;
+  boost::shared_ptr<TMemoryNamespace> const fNs = NewNamespace();
+  boost::shared_ptr<ICIMQualifierDecl> fUnits, fSize;
+  boost::shared_ptr<ICIMNamedElement> fElement;
 };
 
 INSTANTIATE_TEST_SUITE_P(Elements, TMemoryQualifierTest, testing::Values("class", "property", "method", "parameter"),
                          [](auto const& test) { return std::string(test.param); });
 
 TEST_P(TMemoryQualifierTest, QualifierTellsWhatItWasAddedWith) {
-  auto const qualifier = element_->AddQualifier(units_, "bytes", ICIMQualifierDecl::kFlavorToSubclass, kNone);
+  auto const qualifier = fElement->AddQualifier(fUnits, "bytes", ICIMQualifierDecl::kFlavorToSubclass, kNone);
   EXPECT_EQ(qualifier->GetName(kNone), "Unit");
   EXPECT_EQ(qualifier->GetValue(kNone).ToString(), "bytes");
   EXPECT_EQ(qualifier->GetFlavor(kNone), 0x02u);
-  EXPECT_EQ(qualifier->GetDeclaration(kNone), units_);
-  EXPECT_EQ(qualifier->GetOwner(kNone).lock(), element_);
+  EXPECT_EQ(qualifier->GetDeclaration(kNone), fUnits);
+  EXPECT_EQ(qualifier->GetOwner(kNone).lock(), fElement);
 }
 
 TEST_P(TMemoryQualifierTest, QualifiersComeInTheOrderOfAdditionAndAreFoundInAnyCase) {
-  auto const size = element_->AddQualifier(size_, NullOf("uint32"), 0, kNone);
-  element_->AddQualifier(units_, "bytes", 0, kNone);
+  auto const size = fElement->AddQualifier(fSize, NullOf("uint32"), 0, kNone);
+  fElement->AddQualifier(fUnits, "bytes", 0, kNone);
   EXPECT_THAT(QualifierNames(), ElementsAre("Size", "Unit"));
-  EXPECT_EQ(VisitsUntilSecond(*element_, &ICIMNamedElement::EnumerateQualifiers), 2);
-  EXPECT_EQ(element_->GetQualifier("SIZE", kNone), size);
+  EXPECT_EQ(VisitsUntilSecond(*fElement, &ICIMNamedElement::EnumerateQualifiers), 2);
+  EXPECT_EQ(fElement->GetQualifier("SIZE", kNone), size);
   EXPECT_TRUE(size->GetValue(kNone).IsNull());
-  EXPECT_FALSE(element_->GetQualifier("Other", kNone));
+  EXPECT_FALSE(fElement->GetQualifier("Other", kNone));
 }
 
 TEST_P(TMemoryQualifierTest, QualifierIsRefusedWithItsReason) {
   auto const other = NewNamespace();
   auto const stranger = other->CreateQualifierDecl("Unit", NullOf("string"), 0, 0, kNone);
   auto const unknown = other->CreateQualifierDecl("Unknown", NullOf("string"), 0, 0, kNone);
-  element_->AddQualifier(units_, "bytes", 0, kNone);
-  EXPECT_STATUS(element_->AddQualifier(units_, "bytes", 0, kNone), kZEPStatusAlreadyExists);
-  EXPECT_STATUS(element_->AddQualifier(size_, "5", 0, kNone), kZEPStatusTypeMismatch);
-  EXPECT_STATUS(element_->AddQualifier(size_, TCIMValue(), 0, kNone), kZEPStatusTypeMismatch);
-  EXPECT_STATUS(element_->AddQualifier(stranger, "bytes", 0, kNone), kZEPStatusNotFound);
-  EXPECT_STATUS(element_->AddQualifier(unknown, "bytes", 0, kNone), kZEPStatusNotFound);
-  EXPECT_STATUS(element_->AddQualifier(nullptr, "bytes", 0, kNone), kZEPStatusNotFound);
+  fElement->AddQualifier(fUnits, "bytes", 0, kNone);
+  EXPECT_STATUS(fElement->AddQualifier(fUnits, "bytes", 0, kNone), kZEPStatusAlreadyExists);
+  EXPECT_STATUS(fElement->AddQualifier(fSize, "5", 0, kNone), kZEPStatusTypeMismatch);
+  EXPECT_STATUS(fElement->AddQualifier(fSize, TCIMValue(), 0, kNone), kZEPStatusTypeMismatch);
+  EXPECT_STATUS(fElement->AddQualifier(stranger, "bytes", 0, kNone), kZEPStatusNotFound);
+  EXPECT_STATUS(fElement->AddQualifier(unknown, "bytes", 0, kNone), kZEPStatusNotFound);
+  EXPECT_STATUS(fElement->AddQualifier(nullptr, "bytes", 0, kNone), kZEPStatusNotFound);
   EXPECT_THAT(QualifierNames(), ElementsAre("Unit"));
 }
 

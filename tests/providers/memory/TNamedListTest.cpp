@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TNamedList.h"
 #include "tests/Support.h"
 
@@ -54,7 +55,7 @@ TEST(TNamedListTest, EveryElementOfALongListIsFoundAndCanBeReplaced) {
   }
   list.Put(Named("NAME500", -1));
   for (int i = 0; i < 1000; ++i) ASSERT_EQ(list.Find("NAME" + std::to_string(i))->fValue, i == 500 ? -1 : i);
-  const TList copy = list;
+  TList const copy = list;
   list.Clear();
   EXPECT_FALSE(list.Has("name7"));
   EXPECT_EQ(copy.PositionOf("name7"), 7u);

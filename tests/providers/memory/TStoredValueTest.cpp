@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "TStoredValue.h"
 
 #include "Collect.h"
@@ -6,7 +7,7 @@ namespace NQRVZEP20 {
 namespace {
 
 TEST(TStoredValueTest, EveryKindOfValueIsTheSameAgain) {
-  const TType::ECIMType kStrings = TType::ECIMType(TType::kCIMTypeString | TType::kCIMTypeArrayFlag);
+  TType::ECIMType const kStrings = TType::ECIMType(TType::kCIMTypeString | TType::kCIMTypeArrayFlag);
   for (TCIMValue const& value :
        {TCIMValue(), NullOf("string"), NullOf("uint8[16]"), NullOf("boolean"), NullOf("reference"), TCIMValue(kStrings, 4),
         TCIMValue(true), TCIMValue(false), TCIMValue(""), TCIMValue(std::string("a\0b", 3)), TCIMValue(std::string(5000, 'x')),
@@ -22,7 +23,7 @@ TEST(TStoredValueTest, EveryKindOfValueIsTheSameAgain) {
 }
 
 TEST(TStoredValueTest, ANullReferenceKeepsItsClass) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   ns->DefineClass("X_A");
   TCIMValue reference = NullOf("reference");
   reference.SetReferencedClass(ns->GetClass("X_A", kNone));

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Large texts of MOF: that time and memory grow with them and no faster, however deep their classes inherit.
 
 #include "Mof.h"
@@ -25,7 +27,7 @@ std::string Name(int number) { return "X_C" + std::to_string(number); }
 std::string Chain(int depth, bool isAssociation, bool hasInstance) {
   std::string text = kQualifiers;
   for (int at = 0; at < depth; ++at) {
-    const std::string number = std::to_string(at);
+    std::string const number = std::to_string(at);
     if (at == 0 && isAssociation) text += "[Association]\n";
     text += "class " + Name(at) + (at == 0 ? "" : " : " + Name(at - 1)) + " {\n";
     text += at == 0 ? "  [Key] uint32 Id;\n};\n" : "  [Description(\"" + number + "\")] uint32 P" + number + ";\n};\n";
@@ -36,12 +38,12 @@ std::string Chain(int depth, bool isAssociation, bool hasInstance) {
 
 TEST(DeepInheritanceTest, AClassAHundredThousandDeepHasWhatItInherits) {
   constexpr int kDepth = 100000;
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   ReadMofText(Chain(kDepth, true, true), "deep.mof", ns);
-  const auto last = ns->GetClass(Name(kDepth - 1), kNone);
+  auto const last = ns->GetClass(Name(kDepth - 1), kNone);
   EXPECT_TRUE(last->GetClassFlag(kNone));
   EXPECT_EQ(SubClassNames(*ns->GetClass(Name(0), kNone)).size(), kDepth - 1u);
-  const auto instances = All(*last, &ICIMClass::EnumerateInstances);
+  auto const instances = All(*last, &ICIMClass::EnumerateInstances);
   ASSERT_EQ(instances.size(), 1u);
   EXPECT_EQ(instances[0]->GetPath(kNone).GetPath(), Name(kDepth - 1) + ".Id=\"7\"");
   EXPECT_EQ(instances[0]->GetProperty("P1", kNone)->GetValue(kNone).ToString(), "8");
@@ -54,7 +56,7 @@ template <class TAction>
 double SecondsOf(TAction const& action) {
   double best = 1e9;
   for (int run = 0; run < 3; ++run) {
-    const std::clock_t start = std::clock();
+    std::clock_t const start = std::clock();
     action();
     best = std::min(best, static_cast<double>(std::clock() - start) / CLOCKS_PER_SEC);
   }
@@ -62,26 +64,26 @@ double SecondsOf(TAction const& action) {
 }
 
 TEST(DeepInheritanceTest, TenTimesTheDepthDoesNotCostThirtyTimesAsMuch) {
-  for (const bool hasInstance : {false, true}) {
+  for (bool const hasInstance : {false, true}) {
     SCOPED_TRACE(hasInstance);
-    const std::string small = Chain(1000, false, hasInstance), large = Chain(10000, false, hasInstance);
-    const auto read = [](std::string const& text) {
-      const auto ns = NewNamespace();
+    std::string const small = Chain(1000, false, hasInstance), large = Chain(10000, false, hasInstance);
+    auto const read = [](std::string const& text) {
+      auto const ns = NewNamespace();
       ReadMofText(text, "deep.mof", ns);
       for (auto const& root : All(*ns, &ICIMNamespace::EnumerateClasses))
         root->EnumerateSubClasses([](boost::shared_ptr<ICIMClass> cls) { return !cls->GetClassFlag(kNone); }, kNone);
     };
-    const double ofSmall = SecondsOf([&] { read(small); });
+    double const ofSmall = SecondsOf([&] { read(small); });
     EXPECT_LT(SecondsOf([&] { read(large); }), 30 * ofSmall);
   }
 }
 
 TEST(DeepInheritanceTest, InstancesMadeFromTheBottomUpwardsAllHaveTheKeysOfTheTop) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   ReadMofText(Chain(50, false, false), "deep.mof", ns);
   for (int at = 49; at >= 0; --at) {
-    const auto cls = ns->GetClass(Name(at), kNone);
-    const auto instance = cls->CreateInstance(kNone);
+    auto const cls = ns->GetClass(Name(at), kNone);
+    auto const instance = cls->CreateInstance(kNone);
     instance->GetProperty("Id", kNone)->SetValue(TCIMValue(static_cast<unsigned int>(at)), kNone);
     cls->CommitInstance(instance, kNone);
     EXPECT_EQ(instance->GetPath(kNone).GetPath(), Name(at) + ".Id=\"" + std::to_string(at) + "\"");
@@ -91,12 +93,12 @@ TEST(DeepInheritanceTest, InstancesMadeFromTheBottomUpwardsAllHaveTheKeysOfTheTo
 }
 
 TEST(DeepInheritanceTest, AClassIsAnAssociationHoweverLateItsSuperclassIsMarked) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   ReadMofText(Chain(20, false, false), "deep.mof", ns);
-  const auto mark = [&](int at, bool value) {
+  auto const mark = [&](int at, bool value) {
     ns->GetClass(Name(at), kNone)->AddQualifier(ns->GetQualifierDecl("Association", kNone), TCIMValue(value), 0, kNone);
   };
-  const auto isAssociation = [&](int at) { return ns->GetClass(Name(at), kNone)->GetClassFlag(kNone); };
+  auto const isAssociation = [&](int at) { return ns->GetClass(Name(at), kNone)->GetClassFlag(kNone); };
   mark(5, false);
   EXPECT_FALSE(isAssociation(19));
   mark(10, true);
@@ -104,14 +106,14 @@ TEST(DeepInheritanceTest, AClassIsAnAssociationHoweverLateItsSuperclassIsMarked)
   EXPECT_TRUE(isAssociation(10));
   mark(2, true);
   EXPECT_FALSE(isAssociation(1));
-  for (const int at : {2, 5, 9, 19}) EXPECT_TRUE(isAssociation(at)) << at;
+  for (int const at : {2, 5, 9, 19}) EXPECT_TRUE(isAssociation(at)) << at;
   EXPECT_TRUE(ns->CreateClass(ns->GetClass(Name(19), kNone), "X_New", kNone)->GetClassFlag(kNone));
 }
 
 // The greatest memory of a process that reads the file, in bytes.
 double PeakOfReading(std::string const& path) {
   ::malloc_trim(0);  // what the tests before left would be used first
-  const pid_t child = ::fork();
+  pid_t const child = ::fork();
   if (child == 0) {
     ReadMofFile(path, NewNamespace());
     ::_exit(0);
@@ -127,7 +129,7 @@ TEST(DeepInheritanceTest, ASchemaTakesSevenAndAHalfBytesOfMemoryForEachOfItsOwnA
   if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which takes memory of its own";
   std::string text = kQualifiers;
   for (int at = 0; at < 5000; ++at) {
-    const std::string number = std::to_string(at);
+    std::string const number = std::to_string(at);
     text += "[Description(\"Class number " + number + " of the generated schema, which describes a part of a machine.\")]\n" +
             "class " + Name(at) + (at == 0 ? "" : " : " + Name((at - 1) / 3)) + " {\n";
     for (int p = 0; p < 8; ++p)
@@ -139,7 +141,7 @@ TEST(DeepInheritanceTest, ASchemaTakesSevenAndAHalfBytesOfMemoryForEachOfItsOwnA
   TTempDir const dir;
   WriteFile(dir.Path("empty.mof"), "");
   WriteFile(dir.Path("schema.mof"), text);
-  const double taken = PeakOfReading(dir.Path("schema.mof")) - PeakOfReading(dir.Path("empty.mof"));
+  double const taken = PeakOfReading(dir.Path("schema.mof")) - PeakOfReading(dir.Path("empty.mof"));
   EXPECT_LT(taken / static_cast<double>(text.size()), 7.5);
   EXPECT_GT(taken, 0.5 * static_cast<double>(text.size()));  // it was measured at all
 }

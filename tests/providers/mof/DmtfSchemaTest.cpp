@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The real schema, whole: loaded, copied, written and read back.
 
 #include "tests/DmtfSchema.h"
@@ -16,21 +18,21 @@ class DmtfSchemaTest : public testing::Test {
 protected:
   static void SetUpTestSuite() {
     if (DmtfArchive().empty()) return;
-    schema_ = std::make_unique<TDmtfSchema>();
+    fSchema = std::make_unique<TDmtfSchema>();
   }
-  static void TearDownTestSuite() { schema_.reset(); }
+  static void TearDownTestSuite() { fSchema.reset(); }
 
   void SetUp() override {
-    NEEDS(schema_, kNoDmtfSchema);
-    ASSERT_TRUE(schema_->IsThere()) << "unzip failed";
-    ReadMofFile(schema_->MainFile(), source_);
+    NEEDS(fSchema, kNoDmtfSchema);
+    ASSERT_TRUE(fSchema->IsThere()) << "unzip failed";
+    ReadMofFile(fSchema->MainFile(), fSource);
   }
 
-  static std::unique_ptr<TDmtfSchema> schema_;
-  boost::shared_ptr<TMemoryNamespace> source_ = NewNamespace();
+  static std::unique_ptr<TDmtfSchema> fSchema;
+  boost::shared_ptr<TMemoryNamespace> fSource = NewNamespace();
 };
 
-std::unique_ptr<TDmtfSchema> DmtfSchemaTest::schema_;
+std::unique_ptr<TDmtfSchema> DmtfSchemaTest::fSchema;
 
 using TClasses = std::vector<boost::shared_ptr<ICIMClass>>;
 
@@ -82,10 +84,10 @@ private:
 
   void CountProperty(ICIMPropertyDecl const& property) {
     ++fCounts["properties"];
-    const TType type = property.GetType(kNone);
+    TType const type = property.GetType(kNone);
     if ((type & TType::kCIMTypeArrayFlag) != 0) ++fCounts["arrays"];
     ++fCounts[type.ToString()];
-    const TCIMValue value = property.GetDefaultValue(kNone);
+    TCIMValue const value = property.GetDefaultValue(kNone);
     if (value.IsReference() && !value.GetReferencedClass()) ++fCounts["references to nothing"];
     CountQualifiers(property);
   }
@@ -109,7 +111,7 @@ private:
 
 // The figures that a tokeniser of another hand found in the same files.
 TEST_F(DmtfSchemaTest, EverythingInItIsLoaded) {
-  EXPECT_EQ(TCounts(*source_).Get(), (std::map<std::string, int>{{"qualifier declarations", 70},
+  EXPECT_EQ(TCounts(*fSource).Get(), (std::map<std::string, int>{{"qualifier declarations", 70},
                                                                  {"classes", 1631},
                                                                  {"CIM_ classes", 1570},
                                                                  {"PRS_ classes", 61},
@@ -143,34 +145,34 @@ TEST_F(DmtfSchemaTest, EverythingInItIsLoaded) {
 }
 
 TEST_F(DmtfSchemaTest, ACopyHasAllOfItOnceAndTheSameText) {
-  const auto copy = NewNamespace();
+  auto const copy = NewNamespace();
   OnNewThread([&] {
-    const TLogCapture log;
-    TCIMCopy::CopyClasses(source_, copy, false);
+    TLogCapture const log;
+    TCIMCopy::CopyClasses(fSource, copy, false);
     EXPECT_THAT(log.Entries(), IsEmpty());  // nothing was left out
   });
-  EXPECT_EQ(TCounts(*copy).Get(), TCounts(*source_).Get());
-  const std::string text = WriteMof(*source_);
+  EXPECT_EQ(TCounts(*copy).Get(), TCounts(*fSource).Get());
+  std::string const text = WriteMof(*fSource);
   EXPECT_GT(text.size(), 4000000u);
   EXPECT_TRUE(WriteMof(*copy) == text);
 }
 
 TEST_F(DmtfSchemaTest, WhatIsWrittenReadsBackAsTheSame) {
-  const std::string text = WriteMof(*source_);
-  const auto again = NewNamespace();
+  std::string const text = WriteMof(*fSource);
+  auto const again = NewNamespace();
   ReadMofText(text, "schema.mof", again);
-  EXPECT_EQ(TCounts(*again).Get(), TCounts(*source_).Get());
+  EXPECT_EQ(TCounts(*again).Get(), TCounts(*fSource).Get());
   EXPECT_TRUE(WriteMof(*again) == text);
 }
 
 TEST_F(DmtfSchemaTest, TheLongestLineOfDescentHasNineSteps) {
-  EXPECT_EQ(StepsAbove(source_->GetClass("CIM_VTOCDiskPartition", kNone)), 9);
+  EXPECT_EQ(StepsAbove(fSource->GetClass("CIM_VTOCDiskPartition", kNone)), 9);
 }
 
 // A text of the first file that is broken up into lines and escaped.
 TEST_F(DmtfSchemaTest, StringsAreJoinedAndTheirEscapesRead) {
-  const auto caption = source_->GetClass("CIM_ManagedElement", kNone)->GetPropertyDecl("InstanceID", kNone);
-  const std::string text = caption->GetQualifier("Description", kNone)->GetValue(kNone);
+  auto const caption = fSource->GetClass("CIM_ManagedElement", kNone)->GetPropertyDecl("InstanceID", kNone);
+  std::string const text = caption->GetQualifier("Description", kNone)->GetValue(kNone);
   EXPECT_THAT(text,
               testing::StartsWith("InstanceID is an optional property that may be used to opaquely and uniquely identify an "
                                   "instance of this class within the scope of the instantiating Namespace."));

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "ICIMQualifierDecl.h"
 #include "Mof.h"
 #include "TMofError.h"
@@ -28,7 +29,7 @@ public:
 extern "C" ssize_t __real_read(int fd, void* buffer, std::size_t size);
 extern "C" ssize_t __wrap_read(int fd, void* buffer, std::size_t size) {
   if (TReadFault::gError == 0) return __real_read(fd, buffer, size);
-  const auto position = static_cast<std::size_t>(::lseek(fd, 0, SEEK_CUR));
+  auto const position = static_cast<std::size_t>(::lseek(fd, 0, SEEK_CUR));
   if (position < TReadFault::gReadable) return __real_read(fd, buffer, std::min(size, TReadFault::gReadable - position));
   errno = TReadFault::gError;
   return -1;
@@ -53,7 +54,7 @@ constexpr char kQualifiers[] =
     "Qualifier Max : uint32 = 7, Scope(reference);\n";
 
 boost::shared_ptr<TMemoryNamespace> Read(std::string const& text) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   ReadMofText(kQualifiers + text, "test.mof", ns);
   return ns;
 }
@@ -63,7 +64,7 @@ std::string ErrorOf(std::string const& text) {
   try {
     Read(text);
   } catch (TMofError const& error) {
-    const std::string what = error.what();
+    std::string const what = error.what();
     EXPECT_THAT(what, StartsWith("test.mof:"));
     return what.substr(9);
   }
@@ -117,9 +118,9 @@ TEST(MofReaderTest, AQualifierDeclarationHasTypeDefaultScopeAndFlavor) {
                 TType::kCIMTypeUint8 | TType::kCIMTypeArrayFlag, "NULL", 0, Q::kFlavorDefault | Q::kFlavorTranslatable},
        }) {
     SCOPED_TRACE(row.text);
-    const auto decl = Read(row.text)->GetQualifierDecl("Q", kNone);
+    auto const decl = Read(row.text)->GetQualifierDecl("Q", kNone);
     EXPECT_EQ(decl->GetType(kNone), row.type);
-    const TCIMValue value = decl->GetDefaultValue(kNone);
+    TCIMValue const value = decl->GetDefaultValue(kNone);
     EXPECT_EQ(value.IsNull() ? "NULL" : value.ToString(), row.value);
     EXPECT_EQ(decl->GetScope(kNone), row.scope);
     EXPECT_EQ(decl->GetFlavor(kNone), row.flavor);
@@ -131,7 +132,7 @@ TEST(MofReaderTest, AQualifierDeclarationHasTypeDefaultScopeAndFlavor) {
 // ---- Classes ----
 
 TEST(MofReaderTest, ClassesPropertiesAndReferencesAreDeclared) {
-  const auto ns = Read(
+  auto const ns = Read(
       "[Abstract, Description(\"what\" \" it is\")] class X_A { [Key] uint32 Id; string Names[]; uint8 Bytes[16]; };\n"
       "class X_B : x_a { string P = \"d\"; };\n"
       "[Association] CLASS X_Link AS $L { [Key] X_A REF From; X_B ref To; };");
@@ -146,21 +147,21 @@ TEST(MofReaderTest, ClassesPropertiesAndReferencesAreDeclared) {
   EXPECT_EQ(Property(*ns, "X_A", "Names")->GetDefaultValue(kNone).GetMaxArraySize(), 0u);
   EXPECT_EQ(Property(*ns, "X_A", "Bytes")->GetDefaultValue(kNone).GetMaxArraySize(), 16u);
   EXPECT_EQ(Property(*ns, "X_B", "P")->GetDefaultValue(kNone).ToString(), "d");
-  const TCIMValue to = Property(*ns, "X_Link", "To")->GetDefaultValue(kNone);
+  TCIMValue const to = Property(*ns, "X_Link", "To")->GetDefaultValue(kNone);
   EXPECT_TRUE(to.IsReference() && to.IsNull());
   EXPECT_EQ(to.GetReferencedClass(), ns->GetClass("X_B", kNone));
 }
 
 TEST(MofReaderTest, MethodsHaveParameters) {
-  const auto ns = Read(
+  auto const ns = Read(
       "class X_A { uint32 Reset(); [Description(\"f\")] boolean Find([Description(\"n\")] string Names[8], X_A REF Where, "
       "X_A REF All[], datetime When); };");
-  const auto methods = All(*ns->GetClass("X_A", kNone), &ICIMClass::EnumerateMethodDecls);
+  auto const methods = All(*ns->GetClass("X_A", kNone), &ICIMClass::EnumerateMethodDecls);
   ASSERT_EQ(methods.size(), 2u);
   EXPECT_THAT(Names(*methods[0], &ICIMMethodDecl::EnumerateParameterDecls), IsEmpty());
   EXPECT_EQ(methods[1]->GetReturnType(kNone), TType::kCIMTypeBoolean);
   EXPECT_EQ(methods[1]->GetQualifier("Description", kNone)->GetValue(kNone).ToString(), "f");
-  const auto parameters = All(*methods[1], &ICIMMethodDecl::EnumerateParameterDecls);
+  auto const parameters = All(*methods[1], &ICIMMethodDecl::EnumerateParameterDecls);
   ASSERT_EQ(parameters.size(), 4u);
   EXPECT_EQ(parameters[0]->GetType(kNone), TType::kCIMTypeString | TType::kCIMTypeArrayFlag);
   EXPECT_EQ(parameters[0]->GetMaxArraySize(kNone), 8u);
@@ -173,19 +174,19 @@ TEST(MofReaderTest, MethodsHaveParameters) {
 }
 
 TEST(MofReaderTest, ReferencesMayLeadForwardAndInCircles) {
-  const auto ns = Read("class X_A { X_B REF B; }; class X_B { X_A REF A; X_B REF Self; };");
+  auto const ns = Read("class X_A { X_B REF B; }; class X_B { X_A REF A; X_B REF Self; };");
   EXPECT_EQ(Property(*ns, "X_A", "B")->GetDefaultValue(kNone).GetReferencedClass(), ns->GetClass("X_B", kNone));
   EXPECT_EQ(Property(*ns, "X_B", "A")->GetDefaultValue(kNone).GetReferencedClass(), ns->GetClass("X_A", kNone));
 }
 
 TEST(MofReaderTest, WordsThatAreKeywordsElsewhereAreNamesToo) {
-  const auto ns = Read("class Qualifier { string class; uint8 ref; boolean of; string Scope(string any); };");
+  auto const ns = Read("class Qualifier { string class; uint8 ref; boolean of; string Scope(string any); };");
   EXPECT_THAT(Names(*ns->GetClass("Qualifier", kNone), &ICIMClass::EnumeratePropertyDecls), ElementsAre("class", "ref", "of"));
 }
 
 TEST(MofReaderTest, AQualifierWithoutValueIsTrueOrTheDeclaredDefault) {
-  const auto ns = Read("class X_A { [Key, Max, Values, Description] string P; [Key(false), Max(3)] string Q; };");
-  const auto valueOf = [&](char const* property, char const* qualifier) {
+  auto const ns = Read("class X_A { [Key, Max, Values, Description] string P; [Key(false), Max(3)] string Q; };");
+  auto const valueOf = [&](char const* property, char const* qualifier) {
     return Property(*ns, "X_A", property)->GetQualifier(qualifier, kNone)->GetValue(kNone);
   };
   EXPECT_EQ(valueOf("P", "Key"), TCIMValue(true));
@@ -207,17 +208,17 @@ TEST(MofReaderTest, AQualifierHasTheDeclaredFlavorUnlessItNamesItsOwn) {
                           TRow{"Description(\"a\") : Restricted translatable", Q::kFlavorEnableOverride | Q::kFlavorTranslatable},
                           TRow{"Values {\"a\"} : ToSubclass", Q::kFlavorDefault},
                           TRow{"Key : Restricted", Q::kFlavorEnableOverride}, TRow{"Key", Q::kFlavorToSubclass}}) {
-    const auto ns = Read(std::string("class X_A { [") + row.text + "] string P; };");
-    const auto qualifiers = All(*Property(*ns, "X_A", "P"), &ICIMNamedElement::EnumerateQualifiers);
+    auto const ns = Read(std::string("class X_A { [") + row.text + "] string P; };");
+    auto const qualifiers = All(*Property(*ns, "X_A", "P"), &ICIMNamedElement::EnumerateQualifiers);
     ASSERT_EQ(qualifiers.size(), 1u) << row.text;
     EXPECT_EQ(qualifiers.front()->GetFlavor(kNone), row.flavor) << row.text;
   }
 }
 
 TEST(MofReaderTest, TheValueOfAStaticPropertyIsThatOfTheClass) {
-  const auto ns =
+  auto const ns =
       Read("class X_A { [Static] uint16 Count = 3; [Static(false)] uint16 Plain = 4; [Static(null)] uint8 No = 5; };");
-  const auto statics = All(*ns->GetClass("X_A", kNone), &ICIMClass::EnumerateStaticProperties);
+  auto const statics = All(*ns->GetClass("X_A", kNone), &ICIMClass::EnumerateStaticProperties);
   ASSERT_EQ(statics.size(), 1u);
   EXPECT_EQ(statics.front()->GetName(kNone), "Count");
   EXPECT_EQ(statics.front()->GetValue(kNone).ToString(), "3");
@@ -264,7 +265,7 @@ TEST(MofReaderTest, ValuesOfEveryTypeAreRead) {
            TRow{"string P[] = {\"a\" \"b\", NULL};", TCIMValue(TType::kCIMTypeString, 0, {TCIMValue("ab"), NullOf("string")})},
        }) {
     SCOPED_TRACE(row.declaration);
-    const TCIMValue value = DefaultOf(row.declaration);
+    TCIMValue const value = DefaultOf(row.declaration);
     EXPECT_EQ(value, row.value);
     EXPECT_EQ(value.GetMaxArraySize(), row.value.GetMaxArraySize());
   }
@@ -293,7 +294,7 @@ TEST(MofReaderTest, EscapesOfStringsAreResolved) {
 }
 
 TEST(MofReaderTest, BlanksCommentsAndLineEndsSeparate) {
-  const auto ns = Read("/* a\n * block **/class/**/X_A{// end\r\n\tstring\fP\v;};// no line end");
+  auto const ns = Read("/* a\n * block **/class/**/X_A{// end\r\n\tstring\fP\v;};// no line end");
   EXPECT_THAT(ClassNames(*ns), ElementsAre("X_A"));
   EXPECT_THAT(ClassNames(*Read("")), IsEmpty());
   EXPECT_THAT(ClassNames(*Read("// nothing")), IsEmpty());
@@ -316,13 +317,13 @@ std::vector<std::string> PathsOf(ICIMNamespace const& ns, std::string const& cls
 }
 
 TCIMValue ValueOf(ICIMNamespace const& ns, std::string const& path, std::string const& property) {
-  const TCIMReference reference(boost::const_pointer_cast<ICIMNamespace>(ns.GetClass("X_Disk", kNone)->GetNamespace(kNone)),
+  TCIMReference const reference(boost::const_pointer_cast<ICIMNamespace>(ns.GetClass("X_Disk", kNone)->GetNamespace(kNone)),
                                 "ns:" + path, kNone);
   return boost::dynamic_pointer_cast<ICIMInstance>(reference.GetCIMElement(false))->GetProperty(property, kNone)->GetValue(kNone);
 }
 
 TEST(MofReaderTest, InstancesAreMadeWithTheirValues) {
-  const auto ns = Read(std::string(kDisks) +
+  auto const ns = Read(std::string(kDisks) +
                        "instance of X_Disk { Id = 1; Name = \"sda\"; Sizes = {5, 6}; };\n"
                        "[Description(\"dropped\")] INSTANCE OF x_disk { [Key] id = 0x2; Name = NULL; };\n"
                        "instance of X_Disk { Id = 3; };");
@@ -335,7 +336,7 @@ TEST(MofReaderTest, InstancesAreMadeWithTheirValues) {
 }
 
 TEST(MofReaderTest, AReferenceIsAPathOrAnAlias) {
-  const auto ns = Read(std::string(kDisks) +
+  auto const ns = Read(std::string(kDisks) +
                        "instance of X_Link { From = $A; To = \"X_Disk.Id=2\"; };\n"
                        "instance of X_Disk as $a { Id = 1; Mirror = $B; };\n"
                        "instance of X_Disk as $B { Id = 2; Mirror = $A; };\n"
@@ -347,14 +348,14 @@ TEST(MofReaderTest, AReferenceIsAPathOrAnAlias) {
 }
 
 TEST(MofReaderTest, KeysOfEveryTypeAreReadFromPaths) {
-  const auto ns = Read(
+  auto const ns = Read(
       "class X_K { [Key] string S; [Key] boolean B; [Key] sint8 N; [Key] real64 R; [Key] datetime D; [Key] char16 C; };"
       "class X_L { [Key] X_K REF K; }; class X_M { X_L REF L; };"
       "class X_Disk { X_M REF M; };"
       "instance of X_M { L = \"X_L.K=\\\"X_K.S=\\\\\\\"a,\\\\\\\\\\\\\\\"=b\\\\\\\",B=TRUE,N=-5,R=0.5,"
       "D=\\\\\\\"20070315143000.000000+060\\\\\\\",C=','\\\"\"; };");
-  const auto instance = All(*ns->GetClass("X_M", kNone), &ICIMClass::EnumerateInstances).front();
-  const TCIMReference link = instance->GetProperty("L", kNone)->GetValue(kNone);
+  auto const instance = All(*ns->GetClass("X_M", kNone), &ICIMClass::EnumerateInstances).front();
+  TCIMReference const link = instance->GetProperty("L", kNone)->GetValue(kNone);
   link.EnumerateKeyBindings([&](std::pair<std::string, TCIMValue> const& key) {
     EXPECT_EQ(key.second.ToString(), "X_K.B=\"true\",C=\"44\",D=\"20070315143000.000000+060\",N=\"-5\",R=\"0.5\",S=\"a,\\\"=b\"");
     return true;
@@ -475,10 +476,10 @@ TEST(MofReaderTest, AnErrorTellsThePlaceAndWhatWasExpected) {
 
 // As the library itself prints paths.
 TEST(MofReaderTest, KeysOfAnyTypeMayStandInQuotes) {
-  const auto ns = Read(
+  auto const ns = Read(
       "class X_K { [Key] boolean B; [Key] sint8 N; [Key] real64 R; [Key] char16 C; X_K REF Next; };"
       "instance of X_K { B = true; Next = \"X_K.B=\\\"false\\\",C=\\\"65\\\",N=\\\"-5\\\",R=\\\"0.5\\\"\"; };");
-  const auto instance = All(*ns->GetClass("X_K", kNone), &ICIMClass::EnumerateInstances).front();
+  auto const instance = All(*ns->GetClass("X_K", kNone), &ICIMClass::EnumerateInstances).front();
   EXPECT_EQ(instance->GetProperty("Next", kNone)->GetValue(kNone).ToString(), "X_K.B=\"false\",C=\"65\",N=\"-5\",R=\"0.5\"");
 }
 
@@ -529,13 +530,13 @@ TEST(MofReaderTest, AnErrorCarriesTheStatusOfTheRefusal) {
 }
 
 TEST(MofReaderTest, ATextThatIsWrongInFormChangesNothing) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   EXPECT_EQ(StatusOfText("class X_A { }; class X_B {", ns), kZEPStatusInvalidFormat);
   EXPECT_THAT(ClassNames(*ns), IsEmpty());
 }
 
 TEST(MofReaderTest, ASecondTextGoesOnFromTheFirst) {
-  const auto ns = Read("class X_A { };");
+  auto const ns = Read("class X_A { };");
   ReadMofText("class X_B : X_A { [Key] string P; };", "b", ns);
   EXPECT_THAT(SubClassNames(*ns->GetClass("X_A", kNone)), ElementsAre("X_B"));
 }
@@ -545,29 +546,29 @@ TEST(MofReaderTest, ASecondTextGoesOnFromTheFirst) {
 class MofFileTest : public testing::Test {
 protected:
   MofFileTest() {
-    fs::create_directories(dir_.Path("schema/core"));
-    fs::create_directories(dir_.Path("outside"));
-    WriteFile(dir_.Path("outside/out.mof"), "class X_Out { };");
+    fs::create_directories(fDir.Path("schema/core"));
+    fs::create_directories(fDir.Path("outside"));
+    WriteFile(fDir.Path("outside/out.mof"), "class X_Out { };");
   }
 
-  void Write(std::string const& name, std::string const& text) { WriteFile(dir_.Path("schema/" + name), text); }
+  void Write(std::string const& name, std::string const& text) { WriteFile(fDir.Path("schema/" + name), text); }
 
   // What reading schema/all.mof comes to: the classes, or the error without the folder.
   std::string Result() {
-    const auto ns = NewNamespace();
+    auto const ns = NewNamespace();
     try {
-      ReadMofFile(dir_.Path("schema/all.mof"), ns);
+      ReadMofFile(fDir.Path("schema/all.mof"), ns);
     } catch (TMofError const& error) {
       std::string what = error.what();
-      EXPECT_THAT(what, StartsWith(dir_.Path("schema/")));
-      return what.substr(dir_.Path("schema/").size());
+      EXPECT_THAT(what, StartsWith(fDir.Path("schema/")));
+      return what.substr(fDir.Path("schema/").size());
     }
     std::string names;
     for (std::string const& name : ClassNames(*ns)) names += name + " ";
     return names;
   }
 
-  TTempDir dir_;
+  TTempDir fDir;
 };
 
 TEST_F(MofFileTest, IncludesAreReadWhereTheyStandFromTheFolderOfTheirFile) {
@@ -585,12 +586,12 @@ TEST_F(MofFileTest, AnErrorNamesTheIncludedFile) {
 }
 
 TEST_F(MofFileTest, IncludesStayWithinTheFolderOfTheFirstFile) {
-  fs::create_symlink(dir_.Path("outside/out.mof"), dir_.Path("schema/link.mof"));
-  fs::create_directory_symlink(dir_.Path("outside"), dir_.Path("schema/elsewhere"));
+  fs::create_symlink(fDir.Path("outside/out.mof"), fDir.Path("schema/link.mof"));
+  fs::create_directory_symlink(fDir.Path("outside"), fDir.Path("schema/elsewhere"));
   Write("core/up.mof", "#pragma include (\"../../outside/out.mof\")");
   constexpr char kRefusal[] = "the included file lies outside the folder of the first one";
   for (std::string const& name : {std::string("../outside/out.mof"), std::string("core/../../outside/out.mof"),
-                                  std::string("link.mof"), std::string("elsewhere/out.mof"), dir_.Path("outside/out.mof")}) {
+                                  std::string("link.mof"), std::string("elsewhere/out.mof"), fDir.Path("outside/out.mof")}) {
     SCOPED_TRACE(name);
     Write("all.mof", "#pragma include (\"" + name + "\")");
     EXPECT_EQ(Result(), std::string("all.mof:1:18: ") + kRefusal);
@@ -598,12 +599,12 @@ TEST_F(MofFileTest, IncludesStayWithinTheFolderOfTheFirstFile) {
   Write("all.mof", "#pragma include (\"core/up.mof\")");
   EXPECT_EQ(Result(), std::string("core/up.mof:1:18: ") + kRefusal);
 
-  fs::create_directories(dir_.Path("schema2"));
-  WriteFile(dir_.Path("schema2/a.mof"), "class X_A { };");  // a folder whose name only begins alike
+  fs::create_directories(fDir.Path("schema2"));
+  WriteFile(fDir.Path("schema2/a.mof"), "class X_A { };");  // a folder whose name only begins alike
   Write("all.mof", "#pragma include (\"../schema2/a.mof\")");
   EXPECT_EQ(Result(), std::string("all.mof:1:18: ") + kRefusal);
 
-  fs::create_symlink("five.mof", dir_.Path("schema/inside.mof"));
+  fs::create_symlink("five.mof", fDir.Path("schema/inside.mof"));
   Write("five.mof", "class X_5 { };");
   Write("all.mof", "#pragma include (\"inside.mof\")");
   EXPECT_EQ(Result(), "X_5 ");
@@ -629,18 +630,18 @@ TEST_F(MofFileTest, WhatCannotBeReadIsToldWithItsReason) {
   EXPECT_EQ(Result(), "all.mof:1:18: the included file cannot be read: No such file or directory");
   Write("all.mof", "#pragma include (\"core\")");
   EXPECT_EQ(Result(), "all.mof:1:18: the included file cannot be read: Is a directory");
-  EXPECT_EQ(StatusOf([&] { ReadMofFile(dir_.Path("nothing"), NewNamespace()); }), kZEPStatusFileNotFound);
-  EXPECT_EQ(StatusOf([&] { ReadMofFile(dir_.Path("schema"), NewNamespace()); }), kZEPStatusFileSystemError);
+  EXPECT_EQ(StatusOf([&] { ReadMofFile(fDir.Path("nothing"), NewNamespace()); }), kZEPStatusFileNotFound);
+  EXPECT_EQ(StatusOf([&] { ReadMofFile(fDir.Path("schema"), NewNamespace()); }), kZEPStatusFileSystemError);
 }
 
 TEST_F(MofFileTest, AReadErrorInTheMiddleOfAFileIsItsOwnFailureAndNothingIsUsed) {
-  const std::string text = "class X_1 { };\nclass X_2 { };\n";
+  std::string const text = "class X_1 { };\nclass X_2 { };\n";
   Write("all.mof", text);
-  for (const std::size_t readable : {std::size_t(0), text.find('\n') + 1, text.size()}) {  // each a text of its own right
+  for (std::size_t const readable : {std::size_t(0), text.find('\n') + 1, text.size()}) {  // each a text of its own right
     SCOPED_TRACE(readable);
-    const TReadFault fault(readable, EIO);
-    const auto ns = NewNamespace();
-    EXPECT_EQ(StatusOf([&] { ReadMofFile(dir_.Path("schema/all.mof"), ns); }), kZEPStatusFileSystemError);
+    TReadFault const fault(readable, EIO);
+    auto const ns = NewNamespace();
+    EXPECT_EQ(StatusOf([&] { ReadMofFile(fDir.Path("schema/all.mof"), ns); }), kZEPStatusFileSystemError);
     EXPECT_THAT(ClassNames(*ns), IsEmpty());
     EXPECT_EQ(Result(), "all.mof: cannot be read: Input/output error");
   }
@@ -650,7 +651,7 @@ TEST_F(MofFileTest, AReadErrorInTheMiddleOfAFileIsItsOwnFailureAndNothingIsUsed)
 TEST_F(MofFileTest, AReadErrorInAnIncludedFileNamesTheDirective) {
   Write("all.mof", "#pragma include (\"a.mof\")\n");
   Write("a.mof", std::string(100, ' ') + "class X_1 { };");
-  const TReadFault fault(60, EIO);
+  TReadFault const fault(60, EIO);
   EXPECT_EQ(Result(), "all.mof:1:18: the included file cannot be read: Input/output error");
 }
 

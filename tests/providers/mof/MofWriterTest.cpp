@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "ICIMQualifierDecl.h"
 #include "Mof.h"
 #include "TCIMCopy.h"
@@ -12,7 +13,7 @@ using testing::EndsWith;
 using testing::HasSubstr;
 
 boost::shared_ptr<TMemoryNamespace> ReadBack(std::string const& text) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   ReadMofText(text, "written.mof", ns);
   return ns;
 }
@@ -20,13 +21,13 @@ boost::shared_ptr<TMemoryNamespace> ReadBack(std::string const& text) {
 std::string TextOfClass(TMemoryNamespace const& ns, std::string const& name) { return WriteMofClass(*ns.GetClass(name, kNone)); }
 
 TEST(MofWriterTest, QualifierDeclarationsAreWritten) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   ns->CreateQualifierDecl("X_Words", TCIMValue(TType::kCIMTypeString, 3, {TCIMValue("a"), TCIMValue("b")}),
                           ICIMQualifierDecl::kScopeClass | ICIMQualifierDecl::kScopeMethod,
                           ICIMQualifierDecl::kFlavorTranslatable, kNone);
   ns->CreateQualifierDecl("X_Max", NullOf("sint64"), ICIMQualifierDecl::kScopeAny, ICIMQualifierDecl::kFlavorDefault, kNone);
   ns->CreateQualifierDecl("X_None", TCIMValue(true), 0, 0, kNone);
-  const std::string text = WriteMof(*ns);
+  std::string const text = WriteMof(*ns);
   EXPECT_EQ(text,
             "Qualifier X_Words : string[3] = {\"a\", \"b\"},\n"
             "    Scope(class, method),\n"
@@ -44,7 +45,7 @@ TEST(MofWriterTest, QualifierDeclarationsAreWritten) {
 }
 
 TEST(MofWriterTest, AClassIsWritten) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   ns->DefineClass("X_Device").Abstract().Key("Id", "uint32");
   auto const cls = ns->DefineClass("X_Disk", "X_Device")
                        .Description("A \"disk\".")
@@ -88,15 +89,15 @@ TEST(MofWriterTest, AClassIsWritten) {
             "    string Log[]);\n"
             "};\n"
             "\n");
-  const std::string text = WriteMof(*ns);
+  std::string const text = WriteMof(*ns);
   EXPECT_EQ(WriteMof(*ReadBack(text)), text);
 }
 
 TEST(MofWriterTest, ValuesOfEveryTypeComeBackAsTheyWere) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   int number = 0;
   auto cls = ns->DefineClass("X_A");
-  const auto add = [&](char const* type, TCIMValue const& value) { cls.Property("P" + std::to_string(++number), type, value); };
+  auto const add = [&](char const* type, TCIMValue const& value) { cls.Property("P" + std::to_string(++number), type, value); };
   std::string everyByte;
   for (int c = 0; c < 256; ++c) everyByte += static_cast<char>(c);
   add("boolean", true);
@@ -116,68 +117,68 @@ TEST(MofWriterTest, ValuesOfEveryTypeComeBackAsTheyWere) {
   add("string[]", TCIMValue(TType::kCIMTypeString, 0, {}));
   add("string[2]", TCIMValue(TType::kCIMTypeString, 2, {TCIMValue("a, b"), NullOf("string")}));
   add("real64[]", TCIMValue(TType::kCIMTypeReal64, 0, {TCIMValue(0.1), TCIMValue(1e9)}));
-  const auto again = ReadBack(WriteMof(*ns));
+  auto const again = ReadBack(WriteMof(*ns));
   for (auto const& decl : All(*ns->GetClass("X_A", kNone), &ICIMClass::EnumeratePropertyDecls)) {
     SCOPED_TRACE(decl->GetName(kNone));
-    const TCIMValue value = decl->GetDefaultValue(kNone);
-    const TCIMValue read = again->GetClass("X_A", kNone)->GetPropertyDecl(decl->GetName(kNone), kNone)->GetDefaultValue(kNone);
+    TCIMValue const value = decl->GetDefaultValue(kNone);
+    TCIMValue const read = again->GetClass("X_A", kNone)->GetPropertyDecl(decl->GetName(kNone), kNone)->GetDefaultValue(kNone);
     EXPECT_EQ(read, value);
     EXPECT_EQ(read.GetMaxArraySize(), value.GetMaxArraySize());
   }
 }
 
 TEST(MofWriterTest, CharactersComeBackByTheirCode) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   auto cls = ns->DefineClass("X_A");
   for (unsigned short const code : {0, 10, 34, 39, 65, 92, 127, 233, 0xd800, 0xffff})
     cls.Property("P" + std::to_string(code), "char16", TCIMChar16(code));
-  const std::string text = WriteMof(*ns);
+  std::string const text = WriteMof(*ns);
   EXPECT_THAT(text, HasSubstr("char16 P65 = 'A';"));
   EXPECT_THAT(text, HasSubstr("char16 P39 = '\\x0027';"));
   EXPECT_THAT(text, HasSubstr("char16 P34 = '\"';"));
-  const auto again = ReadBack(text);
+  auto const again = ReadBack(text);
   for (auto const& decl : All(*again->GetClass("X_A", kNone), &ICIMClass::EnumeratePropertyDecls))
     EXPECT_EQ("P" + decl->GetDefaultValue(kNone).ToString(), decl->GetName(kNone));
 }
 
 TEST(MofWriterTest, LongTextsAndListsAreBrokenIntoLines) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   std::string words;
   for (int at = 0; at < 60; ++at) words += "word" + std::to_string(at) + " ";
   std::vector<std::string> values(80, "a value");
   ns->DefineClass("X_A").Description(words).Property("P", "uint8").ValueMap(values, values).Description(std::string(300, 'x'));
-  const std::string text = TextOfClass(*ns, "X_A");
+  std::string const text = TextOfClass(*ns, "X_A");
   std::istringstream lines(text);
   for (std::string line; std::getline(lines, line);) EXPECT_LE(line.size(), 105u) << line;
   EXPECT_THAT(text, HasSubstr("[Description(\n     \"word0 word1 "));
-  const auto again = ReadBack(WriteMof(*ns));
+  auto const again = ReadBack(WriteMof(*ns));
   EXPECT_EQ(again->GetClass("X_A", kNone)->GetQualifier("Description", kNone)->GetValue(kNone).ToString(), words);
   EXPECT_EQ(WriteMof(*again), WriteMof(*ns));
 }
 
 TEST(MofWriterTest, NoCharacterIsCutInTwo) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   std::string text;
   for (int at = 0; at < 200; ++at) text += "\xe2\x82\xac";
   ns->DefineClass("X_A").Description(text);
   std::istringstream lines(TextOfClass(*ns, "X_A"));
   for (std::string line; std::getline(lines, line);) {
-    const std::size_t quote = line.find('"');
+    std::size_t const quote = line.find('"');
     if (quote == line.npos) continue;
     EXPECT_EQ(line.substr(quote + 1, 3), "\xe2\x82\xac") << line;
   }
 }
 
 TEST(MofWriterTest, InstancesAreWrittenWithWhatIsNotTheirDefault) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   ns->DefineClass("X_Disk").Key("Id", "uint32").Property("Name", "string", "unnamed").Property("Size", "uint64");
   ns->DefineClass("X_Link").Association().KeyReference("From", "X_Disk").Key("Port", "string");
   ns->DefineClass("X_Use").Reference("Link", "X_Link");
-  const auto disk = ns->AddInstance("X_Disk", {{"Id", 1}, {"Name", "sda"}});
+  auto const disk = ns->AddInstance("X_Disk", {{"Id", 1}, {"Name", "sda"}});
   ns->AddInstance("X_Disk", {{"Id", 2}, {"Name", TCIMValue()}, {"Size", 5}});
-  const auto link = ns->AddInstance("X_Link", {{"From", disk->GetReference()}, {"Port", "a\"\n"}});
+  auto const link = ns->AddInstance("X_Link", {{"From", disk->GetReference()}, {"Port", "a\"\n"}});
   ns->AddInstance("X_Use", {{"Link", link->GetReference()}});
-  const std::string text = WriteMof(*ns);
+  std::string const text = WriteMof(*ns);
   EXPECT_THAT(text, EndsWith("instance of X_Disk {\n"
                              "  Id = 1;\n"
                              "  Name = \"sda\";\n"
@@ -198,13 +199,13 @@ TEST(MofWriterTest, InstancesAreWrittenWithWhatIsNotTheirDefault) {
                              "  Port = \"a\\\"\\n\";\n"
                              "};\n"
                              "\n"));
-  const auto again = ReadBack(text);
+  auto const again = ReadBack(text);
   EXPECT_EQ(WriteMof(*again), text);
   EXPECT_EQ(InstancePaths(*again->GetClass("X_Link", kNone)), InstancePaths(*ns->GetClass("X_Link", kNone)));
 }
 
 TEST(MofWriterTest, PlainClassesStandAboveAssociationsAndACopyHasTheSameText) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   ns->DefineClass("X_Link").Association();
   ns->DefineClass("X_B");
   ns->DefineClass("X_FastLink", "X_Link");
@@ -212,14 +213,14 @@ TEST(MofWriterTest, PlainClassesStandAboveAssociationsAndACopyHasTheSameText) {
   ns->DefineClass("X_Mixed", "X_B").Association();
   ns->DefineClass("X_Plain", "X_B");
   ns->AddInstance("QRVSG_ZEPProduct", {{"Name", "a"}});
-  const std::string text = WriteMof(*ns);
+  std::string const text = WriteMof(*ns);
   std::vector<std::string> classes;
   std::istringstream lines(text);
   for (std::string line; std::getline(lines, line);)
     if (line.rfind("class ", 0) == 0) classes.push_back(line.substr(6, line.find(' ', 6) - 6));
   EXPECT_THAT(classes, ElementsAre("X_B", "QRVSG_ZEPProduct", "X_Plain", "X_Mixed", "X_Link", "X_FastLink"));
 
-  const auto copy = NewNamespace();
+  auto const copy = NewNamespace();
   TCIMCopy::CopyClasses(ns, copy, false);
   EXPECT_EQ(WriteMof(*copy), text);
   EXPECT_EQ(WriteMof(*ReadBack(text)), text);
@@ -227,12 +228,12 @@ TEST(MofWriterTest, PlainClassesStandAboveAssociationsAndACopyHasTheSameText) {
 
 // Where an association is a subclass of a plain class, the copy comes to it later than the source.
 TEST(MofWriterTest, ACopyHasTheSameTextWhereKindsAreMixed) {
-  const auto ns = NewNamespace();
+  auto const ns = NewNamespace();
   ns->DefineClass("X_Top");
   ns->DefineClass("X_Link", "X_Top").Association();
   ns->DefineClass("X_Plain", "X_Top");
   ns->DefineClass("X_LowLink", "X_Plain").Association();
-  const auto copy = NewNamespace();
+  auto const copy = NewNamespace();
   TCIMCopy::CopyClasses(ns, copy, false);
   EXPECT_EQ(WriteMof(*copy), WriteMof(*ns));
   EXPECT_EQ(WriteMof(*ReadBack(WriteMof(*ns))), WriteMof(*ns));
@@ -240,7 +241,7 @@ TEST(MofWriterTest, ACopyHasTheSameTextWhereKindsAreMixed) {
 
 TEST(MofWriterTest, WhatMofCannotSayIsRefused) {
   using TDefine = std::function<void(TMemoryNamespace&)>;
-  const std::pair<char const*, TDefine> rows[] = {
+  std::pair<char const*, TDefine> const rows[] = {
       {"a reference to no class", [](TMemoryNamespace& ns) { ns.DefineClass("X_A").Property("P", "reference"); }},
       {"an array of references", [](TMemoryNamespace& ns) { ns.DefineClass("X_A").Property("P", "reference[]"); }},
       {"a number without end",
@@ -251,7 +252,7 @@ TEST(MofWriterTest, WhatMofCannotSayIsRefused) {
        [](TMemoryNamespace& ns) { ns.DefineClass("X_A").Property("P", "char16", TCIMChar16(std::string("A"))); }},
       {"a NULL character among others",
        [](TMemoryNamespace& ns) {
-         const std::vector<TCIMValue> characters = {TCIMValue(TCIMChar16(65)), TCIMValue(TCIMChar16(std::string()))};
+         std::vector<TCIMValue> const characters = {TCIMValue(TCIMChar16(65)), TCIMValue(TCIMChar16(std::string()))};
          ns.DefineClass("X_A").Property("P", "char16[]", TCIMValue(TType::kCIMTypeChar16, 0, characters));
        }},
       {"a method that returns a reference",
@@ -277,7 +278,7 @@ TEST(MofWriterTest, WhatMofCannotSayIsRefused) {
   };
   for (auto const& [what, define] : rows) {
     SCOPED_TRACE(what);
-    const auto ns = NewNamespace();
+    auto const ns = NewNamespace();
     define(*ns);
     EXPECT_STATUS(WriteMof(*ns), kZEPStatusNotSupported);
   }

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // libipmiClient.so over a network that delays, loses, doubles and reorders. What a controller carried out is counted in its
 // event log.
 
@@ -30,20 +32,20 @@ protected:
     EnterNetworkNamespace();
     StartController();
   }
-  void TearDown() override { client_.close(); }
+  void TearDown() override { fClient.close(); }
 
   void StartController() {
-    simulator_.reset();
+    fSimulator.reset();
     TSimulator::TSettings settings;
     settings.port = kControllersPort;
-    simulator_.emplace(settings);
-    simulator_->WaitUntilReady();
+    fSimulator.emplace(settings);
+    fSimulator->WaitUntilReady();
   }
 
   // Puts a network between the client and the controller. The rule lives longer than the test's own variables.
   void Relay(EVersion version, TRelay::TRule const& rule) {
-    relay_.reset();
-    relay_.emplace(623, kControllersPort, [version, rule](TRelay::TDatagram& datagram) {
+    fRelay.reset();
+    fRelay.emplace(623, kControllersPort, [version, rule](TRelay::TDatagram& datagram) {
       if (version == kVersion15 && datagram.isAnswer) datagram.bytes = WithoutVersion2(datagram.bytes);
       return rule(datagram);
     });
@@ -51,18 +53,18 @@ protected:
 
   // How many events the controller logged meanwhile; asked for without the network between.
   int NewEvents() {
-    client_.close();
-    client_.Open(kControllersPort);
-    int const before = events_;
-    events_ = client_.Events();
-    client_.close();
-    return events_ - before;
+    fClient.close();
+    fClient.Open(kControllersPort);
+    int const before = fEvents;
+    fEvents = fClient.Events();
+    fClient.close();
+    return fEvents - before;
   }
 
-  TIpmiClientLibrary const client_;
-  std::optional<TSimulator> simulator_;
-  std::optional<TRelay> relay_;
-  int events_ = 0;
+  TIpmiClientLibrary const fClient;
+  std::optional<TSimulator> fSimulator;
+  std::optional<TRelay> fRelay;
+  int fEvents = 0;
 };
 
 // ---- One mishap to one packet ----
@@ -89,9 +91,9 @@ TEST_P(MishapTest, IsGotOverInEveryPlace) {
       Relay(mishap.version, [&mishap, isAnswer, place](TRelay::TDatagram const& datagram) {
         return datagram.isAnswer == isAnswer && datagram.place == place ? mishap.fate : TRelay::AtOnce();
       });
-      EXPECT_EQ(client_.Open(623), kIpmiClientOk);
-      EXPECT_EQ(client_.AddEvent(), kIpmiClientOk);
-      client_.close();
+      EXPECT_EQ(fClient.Open(623), kIpmiClientOk);
+      EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
+      fClient.close();
       // The simulator carries out what comes twice: a command whose answer was lost, and a copy made on the way. A query
       // that was sent again because this machine is busy moves the places by one.
       bool const mayComeTwice = place >= placeOfCommand && mishap.fate.size() != 1;
@@ -117,24 +119,24 @@ INSTANTIATE_TEST_SUITE_P(All, EachVersionTest, testing::Values(kVersion2, kVersi
 TEST_P(EachVersionTest, EveryPacketMayComeTwice) {
   for (auto const after : {0ms, 20ms}) {
     Relay(GetParam(), [after](auto const&) { return TFate{0ms, after}; });
-    ASSERT_EQ(client_.Open(623), kIpmiClientOk);
-    for (int n = 0; n < 5; ++n) EXPECT_EQ(client_.AddEvent(), kIpmiClientOk);
+    ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
+    for (int n = 0; n < 5; ++n) EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
     EXPECT_GE(NewEvents(), 5) << "the simulator carries out a copy of the packet before";
   }
 }
 
 TEST_P(EachVersionTest, AnswersMayTake3Seconds) {
   Relay(GetParam(), [](auto const& datagram) { return TFate{datagram.isAnswer ? 3000ms : 0ms}; });
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
-  EXPECT_EQ(client_.AddEvent(), kIpmiClientOk);
-  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
+  EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
   EXPECT_EQ(NewEvents(), 1) << "a slow controller gets a command once";
 }
 
 TEST_F(BadNetworkTest, BothWaysMayTake3Seconds) {
   Relay(kVersion2, [](auto const&) { return TFate{3000ms}; });
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
-  EXPECT_EQ(client_.AddEvent(), kIpmiClientOk);
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
+  EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
   EXPECT_EQ(NewEvents(), 1);
 }
 
@@ -147,9 +149,9 @@ TEST_P(EachVersionTest, AFifthMayBeLostAndAFifthDoubledAndAllOvertakeOneAnother)
       std::chrono::milliseconds const delay(random() % 200), another(random() % 200);
       return lot == 0 ? TFate{} : lot == 1 ? TFate{delay, another} : TFate{delay};
     });
-    ASSERT_EQ(client_.Open(623), kIpmiClientOk);
-    EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
-    EXPECT_EQ(client_.AddEvent(), kIpmiClientOk);
+    ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
+    EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+    EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
     EXPECT_GE(NewEvents(), 1);
   }
 }
@@ -158,8 +160,8 @@ TEST_F(BadNetworkTest, AFifthMayBeLostWhereAnswersTake3Seconds) {
   Relay(kVersion2, [random = std::mt19937(7)](auto const& datagram) mutable {
     return random() % 5 == 0 ? TFate{} : TFate{datagram.isAnswer ? 3000ms : 0ms};
   });
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
-  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
 }
 
 // ---- A command is carried out once ----
@@ -184,10 +186,10 @@ TEST_F(BadNetworkTest, ACommandThatIsSentAgainHasTheSameRequestNumber) {
     bool const isLost = datagram.isAnswer && IsOfCommand(datagram.bytes, kAddEvent) && ++answers <= 2;
     return isLost ? TFate{} : TRelay::AtOnce();
   });
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
-  EXPECT_EQ(client_.AddEvent(), kIpmiClientOk);
-  EXPECT_EQ(client_.AddEvent(), kIpmiClientOk);
-  auto const sent = OfCommand(relay_->Requests(), kAddEvent);
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
+  EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
+  EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
+  auto const sent = OfCommand(fRelay->Requests(), kAddEvent);
   ASSERT_EQ(sent.size(), 4u) << "three times the one, once the other";
   std::set<std::string> packetNumbers;
   for (std::string const& request : sent) packetNumbers.insert(request.substr(kPacketNumber, 4));
@@ -199,23 +201,23 @@ TEST_F(BadNetworkTest, ACommandThatIsSentAgainHasTheSameRequestNumber) {
 
 TEST_P(EachVersionTest, AnIdleSessionIsNoReasonToSendACommandTwice) {
   Relay(GetParam(), [](auto const&) { return TRelay::AtOnce(); });
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   std::this_thread::sleep_for(4300ms);
-  EXPECT_EQ(client_.AddEvent(), kIpmiClientOk);
+  EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
   EXPECT_EQ(NewEvents(), 1);
 }
 
 TEST_F(BadNetworkTest, AForgottenSessionIsNoReasonToSendACommandInAnother) {
   Relay(kVersion2, [](auto const&) { return TRelay::AtOnce(); });
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   StartController();
-  std::size_t const before = relay_->Requests().size();
-  EXPECT_EQ(client_.AddEvent(), kIpmiClientNoAnswer) << "the controller may have carried it out";
-  auto const requests = relay_->Requests();
+  std::size_t const before = fRelay->Requests().size();
+  EXPECT_EQ(fClient.AddEvent(), kIpmiClientNoAnswer) << "the controller may have carried it out";
+  auto const requests = fRelay->Requests();
   EXPECT_GT(requests.size(), before + 1) << "in the session it is sent again";
   for (std::size_t n = before; n < requests.size(); ++n)
     EXPECT_EQ(requests[n][5] & 0x3F, 0) << "nothing but messages is sent: no session is opened";
-  EXPECT_EQ(client_.AddEvent(), kIpmiClientOk) << "the next command opens one";
+  EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk) << "the next command opens one";
   EXPECT_EQ(NewEvents(), 1);
 }
 
@@ -223,7 +225,7 @@ TEST_F(BadNetworkTest, AForgottenSessionIsNoReasonToSendACommandInAnother) {
 
 TEST_F(BadNetworkTest, AnEchoMakesNoSense) {
   TUdpPeer const echo(623, [](std::string const& datagram) { return datagram; });
-  EXPECT_EQ(client_.Open(623), kIpmiClientFail);
+  EXPECT_EQ(fClient.Open(623), kIpmiClientFail);
 }
 
 TEST_F(BadNetworkTest, AnEchoInEveryLaterPlaceMakesNoSenseEither) {
@@ -235,7 +237,7 @@ TEST_F(BadNetworkTest, AnEchoInEveryLaterPlaceMakesNoSenseEither) {
       if (datagram.isAnswer && datagram.place >= place) datagram.bytes = request;
       return TRelay::AtOnce();
     });
-    EXPECT_EQ(client_.Open(623), kIpmiClientFail);
+    EXPECT_EQ(fClient.Open(623), kIpmiClientFail);
   }
 }
 
@@ -246,9 +248,9 @@ TEST_F(BadNetworkTest, APrivilegeThatALateCopyTookAwayIsAskedForAgain) {
     bool const isCopied = !datagram.isAnswer && datagram.bytes[5] == kFirstNumber;
     return isCopied ? TFate{0ms, 500ms} : TRelay::AtOnce();
   });
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   std::this_thread::sleep_for(1s);
-  EXPECT_EQ(client_.AddEvent(), kIpmiClientOk);
+  EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
   EXPECT_EQ(NewEvents(), 1);
 }
 
@@ -261,9 +263,9 @@ TEST_F(BadNetworkTest, AnOpeningThatGotOutOfStepIsBegunAnew) {
     if (isFirst) datagram.bytes.back() = static_cast<char>(datagram.bytes.back() ^ 1);
     return TRelay::AtOnce();
   });
-  EXPECT_EQ(client_.Open(623), kIpmiClientOk);
+  EXPECT_EQ(fClient.Open(623), kIpmiClientOk);
   EXPECT_GE(*proofs, 2);
-  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
 }
 
 }  // namespace

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // Management controllers for tests: the simulator ipmi_sim on addresses of a network namespace, peers that misbehave, and

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // libipmiClient.so against simulated controllers.
 
 #include "tests/system/ipmi/IpmiBed.h"
@@ -26,35 +28,35 @@ protected:
     NEEDS(HasIpmiBed(), kIpmiBedNeeds);
     EnterNetworkNamespace();
   }
-  void TearDown() override { client_.close(); }
+  void TearDown() override { fClient.close(); }
 
   TSimulator& Start(TSimulator::TSettings const& settings = {}) {
-    simulator_.reset();
-    simulator_.emplace(settings);
-    simulator_->WaitUntilReady();
-    return *simulator_;
+    fSimulator.reset();
+    fSimulator.emplace(settings);
+    fSimulator->WaitUntilReady();
+    return *fSimulator;
   }
 
-  TIpmiClientLibrary const client_;
-  std::optional<TSimulator> simulator_;
+  TIpmiClientLibrary const fClient;
+  std::optional<TSimulator> fSimulator;
 };
 
 TEST_F(IpmiClientTest, ReadsFruData) {
   Start();
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
-  auto const read = client_.ReadFru(0x1AC, 0x1E);
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
+  auto const read = fClient.ReadFru(0x1AC, 0x1E);
   EXPECT_EQ(read.result, kIpmiClientOk);
   EXPECT_EQ(read.completionCode, 0);
   EXPECT_EQ(read.data,
             "\x1E"
             "1234AB7\0"s +
                 std::string(22, ' '));
-  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
 }
 
 TEST_F(IpmiClientTest, ARefusedCommandTellsWhy) {
   Start();
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   struct TRow {
     char const* what;
     unsigned offset;
@@ -64,19 +66,19 @@ TEST_F(IpmiClientTest, ARefusedCommandTellsWhy) {
   TRow const rows[] = {{"an offset behind the data", 0x7000, 0, 0xC9}, {"no such device", 0, 9, 0xCC}};
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);
-    auto const read = client_.ReadFru(row.offset, 7, row.device);
+    auto const read = fClient.ReadFru(row.offset, 7, row.device);
     EXPECT_EQ(read.result, kIpmiClientCompletionCode);
     EXPECT_NE(read.completionCode, 0);
     EXPECT_NE(read.completionCode, 0xFF);
     EXPECT_EQ(read.data, "");
   }
-  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345") << "the session goes on";
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345") << "the session goes on";
 }
 
 TEST_F(IpmiClientTest, AnAnswerMayBeShorterThanAskedFor) {
   Start();
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
-  EXPECT_EQ(client_.ReadFru(1024 - 3, 0x1E).data, "\x03\xFF\xFF\xFF");
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
+  EXPECT_EQ(fClient.ReadFru(1024 - 3, 0x1E).data, "\x03\xFF\xFF\xFF");
 }
 
 TEST_F(IpmiClientTest, EachReasonNotToOpenHasItsCode) {
@@ -106,24 +108,24 @@ TEST_F(IpmiClientTest, EachReasonNotToOpenHasItsCode) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);
     auto const start = TClock::now();
-    EXPECT_EQ(client_.open(kIpmiClientLan, row.host, row.port, row.user, row.password), row.result);
+    EXPECT_EQ(fClient.open(kIpmiClientLan, row.host, row.port, row.user, row.password), row.result);
     EXPECT_LT(SecondsSince(start), row.longestSeconds);
-    EXPECT_EQ(client_.ReadFru(0, 1).result, kIpmiClientNoSession);
+    EXPECT_EQ(fClient.ReadFru(0, 1).result, kIpmiClientNoSession);
   }
   for (int mode : {0, 1, 2, 4, -1})
-    EXPECT_EQ(client_.open(mode, "127.0.0.1", "623", "zepadmin", "zeppass1"), kIpmiClientBadArgument) << mode;
+    EXPECT_EQ(fClient.open(mode, "127.0.0.1", "623", "zepadmin", "zeppass1"), kIpmiClientBadArgument) << mode;
 }
 
 TEST_F(IpmiClientTest, OtherAccountsOpenAsWell) {
   Start();
-  EXPECT_EQ(client_.open(kIpmiClientLan, "localhost", "623", "zep16", "abcdefghijklmnop"), kIpmiClientOk);
-  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  EXPECT_EQ(fClient.open(kIpmiClientLan, "localhost", "623", "zep16", "abcdefghijklmnop"), kIpmiClientOk);
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
 }
 
 TEST_F(IpmiClientTest, ASilentControllerIsGivenUpAfter7Seconds) {
   TUdpPeer silent(623, [](std::string const&) { return std::nullopt; });
   auto const start = TClock::now();
-  EXPECT_EQ(client_.Open(623), kIpmiClientNoAnswer);
+  EXPECT_EQ(fClient.Open(623), kIpmiClientNoAnswer);
   EXPECT_GT(SecondsSince(start), 6.9);
   EXPECT_LT(SecondsSince(start), 60);
   EXPECT_GT(silent.Received(), 1) << "it should have been asked more than once";
@@ -138,7 +140,7 @@ TEST_F(IpmiClientTest, GarbageIsNoSession) {
     return bytes;
   });
   auto const start = TClock::now();
-  EXPECT_NE(client_.Open(623), kIpmiClientOk);
+  EXPECT_NE(fClient.Open(623), kIpmiClientOk);
   EXPECT_LT(SecondsSince(start), 10);
   EXPECT_GT(garbage.Received(), 0);
 }
@@ -153,8 +155,8 @@ TEST_F(IpmiClientTest, AMangledAnswerIsNeverTakenForTheTruth) {
   });
   for (int round = 0; round < 3; ++round) {
     auto const start = TClock::now();
-    client_.Open(623);
-    std::string const data = client_.ReadFru(0x1CC, 7).data;
+    fClient.Open(623);
+    std::string const data = fClient.ReadFru(0x1CC, 7).data;
     EXPECT_TRUE(data == "" || data == "\x07KQ12345") << data;
     EXPECT_LT(SecondsSince(start), 20);
   }
@@ -164,9 +166,9 @@ TEST_F(IpmiClientTest, AMangledAnswerIsNeverTakenForTheTruth) {
 TEST_F(IpmiClientTest, OpeningClosesTheSessionBefore) {
   Start();
   // The simulator has room for 63 sessions.
-  for (int round = 0; round < 70; ++round) ASSERT_EQ(client_.Open(623), kIpmiClientOk) << round;
-  EXPECT_EQ(client_.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "wrong"), kIpmiClientWrongPassword);
-  EXPECT_EQ(client_.ReadFru(0, 1).result, kIpmiClientNoSession) << "also when opening fails";
+  for (int round = 0; round < 70; ++round) ASSERT_EQ(fClient.Open(623), kIpmiClientOk) << round;
+  EXPECT_EQ(fClient.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "wrong"), kIpmiClientWrongPassword);
+  EXPECT_EQ(fClient.ReadFru(0, 1).result, kIpmiClientNoSession) << "also when opening fails";
 }
 
 // A process that holds a session until the object ends.
@@ -205,44 +207,44 @@ TEST_F(IpmiClientTest, AControllerWithoutASessionLeftIsBusy) {
   Start();
   constexpr int kRoom = 63;
   std::list<TSessionHolder> holders;
-  for (int n = 0; n < kRoom; ++n) ASSERT_EQ(holders.emplace_back(client_).Result(), kIpmiClientOk) << n;
-  EXPECT_EQ(client_.Open(623), kIpmiClientBusy);
+  for (int n = 0; n < kRoom; ++n) ASSERT_EQ(holders.emplace_back(fClient).Result(), kIpmiClientOk) << n;
+  EXPECT_EQ(fClient.Open(623), kIpmiClientBusy);
 }
 
 TEST_F(IpmiClientTest, ClosingEndsTheSession) {
   Start();
-  EXPECT_EQ(client_.close(), 0) << "also without one";
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
-  EXPECT_EQ(client_.close(), 0);
-  EXPECT_EQ(client_.ReadFru(0, 1).result, kIpmiClientNoSession);
-  EXPECT_EQ(client_.close(), 0);
+  EXPECT_EQ(fClient.close(), 0) << "also without one";
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
+  EXPECT_EQ(fClient.close(), 0);
+  EXPECT_EQ(fClient.ReadFru(0, 1).result, kIpmiClientNoSession);
+  EXPECT_EQ(fClient.close(), 0);
 }
 
 TEST_F(IpmiClientTest, ArgumentsThatCannotBeUsedAreRefused) {
   Start();
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   unsigned char bytes[256] = {};
   unsigned short length = 0;
   unsigned char code = 0xFF;
-  EXPECT_EQ(client_.send(1, nullptr, 1, bytes, &length, &code, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(client_.send(1, bytes, -1, bytes, &length, &code, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(client_.send(1, bytes, 256, bytes, &length, &code, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(client_.send(1, bytes, 0, nullptr, &length, &code, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(client_.send(1, bytes, 0, bytes, nullptr, &code, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(client_.send(1, bytes, 0, bytes, &length, nullptr, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(client_.send(1, bytes, 0, bytes, &length, &code, 0x1E), kIpmiClientBadArgument) << "a reserved network function";
-  EXPECT_EQ(client_.send(1, nullptr, 0, bytes, &length, &code, 6), kIpmiClientOk) << "Get Device ID has no data";
+  EXPECT_EQ(fClient.send(1, nullptr, 1, bytes, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.send(1, bytes, -1, bytes, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.send(1, bytes, 256, bytes, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.send(1, bytes, 0, nullptr, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.send(1, bytes, 0, bytes, nullptr, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.send(1, bytes, 0, bytes, &length, nullptr, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.send(1, bytes, 0, bytes, &length, &code, 0x1E), kIpmiClientBadArgument) << "a reserved network function";
+  EXPECT_EQ(fClient.send(1, nullptr, 0, bytes, &length, &code, 6), kIpmiClientOk) << "Get Device ID has no data";
   EXPECT_GT(length, 10);
 }
 
 TEST_F(IpmiClientTest, AControllerStoppedInMidSessionGivesNoAnswerAndComesBack) {
   TSimulator const& simulator = Start();
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
-  ASSERT_EQ(client_.ReadFru(0x1CC, 7).result, kIpmiClientOk);
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
+  ASSERT_EQ(fClient.ReadFru(0x1CC, 7).result, kIpmiClientOk);
   simulator.Stop();
-  EXPECT_EQ(client_.ReadFru(0x1CC, 7).result, kIpmiClientNoAnswer);
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).result, kIpmiClientNoAnswer);
   simulator.GoOn();
-  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345") << "the next command tries again";
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345") << "the next command tries again";
 }
 
 // ---- A controller that speaks 1.5 only ----
@@ -257,12 +259,12 @@ TEST_F(IpmiClientTest, AControllerThatSpeaksOnly15IsSpokenToLikeThat) {
     return answer ? std::optional(WithoutVersion2(*answer)) : std::nullopt;
   });
   auto const start = TClock::now();
-  ASSERT_EQ(client_.Open(623), kIpmiClientOk);
-  EXPECT_EQ(client_.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
   EXPECT_LT(SecondsSince(start), 4);
-  EXPECT_EQ(client_.open(kIpmiClientLan, "127.0.0.1", "623", "nobody", "zeppass1"), kIpmiClientUnknownUser);
-  EXPECT_EQ(client_.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "wrong"), kIpmiClientWrongPassword);
-  EXPECT_EQ(client_.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "seventeen letters"), kIpmiClientBadArgument)
+  EXPECT_EQ(fClient.open(kIpmiClientLan, "127.0.0.1", "623", "nobody", "zeppass1"), kIpmiClientUnknownUser);
+  EXPECT_EQ(fClient.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "wrong"), kIpmiClientWrongPassword);
+  EXPECT_EQ(fClient.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "seventeen letters"), kIpmiClientBadArgument)
       << "version 1.5 has room for 16";
   EXPECT_EQ(asked2, 0) << "nothing was sent in version 2.0";
 }

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The identity of remote servers, from simulated controllers: by the library, and by zep.
 
 #include "TOSSpecific.h"
@@ -31,11 +33,11 @@ protected:
     std::string image(size, ' ');
     image.replace(0, 8, "\1\0\0\0\0\0\0\xFF"s);
     image.replace(0x1AC, 8, "1234AB7\0"s);
-    WriteFile(dir_.Path("fru"), image);
-    return dir_.Path("fru");
+    WriteFile(fDir.Path("fru"), image);
+    return fDir.Path("fru");
   }
 
-  TTempDir dir_;
+  TTempDir fDir;
 };
 
 // ---- The library ----
@@ -78,7 +80,7 @@ TEST_F(RemoteLibraryTest, AShortAnswerGivesWhatIsThere) {
 
 class ZepRemoteTest : public RemoteSystemTest {
 protected:
-  ZepRemoteTest() { zep_.Add("libipmiClient.so", TEST_LIB_DIR "/libipmiClient.so"); }
+  ZepRemoteTest() { fZep.Add("libipmiClient.so", TEST_LIB_DIR "/libipmiClient.so"); }
 
   zep::TRun Run(std::vector<std::string> arguments, std::string const& password = "zeppass1",
                 std::string const& user = "zepadmin") {
@@ -87,10 +89,10 @@ protected:
     zep::TCall call = {arguments};
     call.environment = {{"ZEP_BMC_PASSWORD", password}};
     call.hasNoTerminal = true;
-    return zep_.Run(call);
+    return fZep.Run(call);
   }
 
-  zep::TInstallation zep_;
+  zep::TInstallation fZep;
 };
 
 TEST_F(ZepRemoteTest, TellsTypeModelAndSerialNumber) {
@@ -108,10 +110,10 @@ TEST_F(ZepRemoteTest, TellsTypeModelAndSerialNumber) {
   EXPECT_EQ(zep::JsonOf(json)["model"], "AB7");
   EXPECT_EQ(zep::JsonOf(json)["serialNumber"], "KQ12345");
 
-  WriteFile(dir_.Path("password"), "zeppass1\nnot this line");
-  EXPECT_EQ(Run({"127.0.0.1", "--password-file", dir_.Path("password")}, "wrong").status, 0) << "the file counts first";
-  WriteFile(dir_.Path("password"), "zeppass1\r\n");
-  EXPECT_EQ(Run({"127.0.0.1", "--password-file", dir_.Path("password")}, "wrong").status, 0) << "of another system's editor";
+  WriteFile(fDir.Path("password"), "zeppass1\nnot this line");
+  EXPECT_EQ(Run({"127.0.0.1", "--password-file", fDir.Path("password")}, "wrong").status, 0) << "the file counts first";
+  WriteFile(fDir.Path("password"), "zeppass1\r\n");
+  EXPECT_EQ(Run({"127.0.0.1", "--password-file", fDir.Path("password")}, "wrong").status, 0) << "of another system's editor";
 }
 
 TEST_F(ZepRemoteTest, ARefusedAccountTellsNothing) {
@@ -181,7 +183,7 @@ TEST_F(ZepRemoteTest, FruDataThatNobodyProgrammedAreToldAsSuch) {
 TEST_F(ZepRemoteTest, ThePasswordReachesNeitherOutputNorLog) {
   TSimulator simulator({});
   simulator.WaitUntilReady();
-  std::string const log = dir_.Path("log");
+  std::string const log = fDir.Path("log");
   zep::TRun const run = Run({"127.0.0.1", "--debug-log", log});
   EXPECT_EQ(run.status, 0);
   EXPECT_THAT(ReadFile(log), HasSubstr("rspBuffer for GetRemoteMSN:"));
@@ -224,9 +226,9 @@ TEST_F(ZepRemoteTest, AListOfAThousandIsDoneWhateverBecomesOfSome) {
     else
       hosts += "127.1." + std::to_string(n / 200) + "." + last + "\n";
   }
-  WriteFile(dir_.Path("hosts"), hosts);
+  WriteFile(fDir.Path("hosts"), hosts);
   auto const start = TClock::now();
-  zep::TRun const run = Run({"--hosts", dir_.Path("hosts"), "--parallel", "50"});
+  zep::TRun const run = Run({"--hosts", fDir.Path("hosts"), "--parallel", "50"});
   EXPECT_LT(SecondsSince(start), 60);
   EXPECT_EQ(run.status, 2);
   EXPECT_EQ(run.errors, "zep: 1000 of 1000 hosts done, 110 failed\n");

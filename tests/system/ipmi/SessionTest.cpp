@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A session of libipmiClient.so's with other times than the library's.
 
 #include "platform/ipmi/TSession.h"
@@ -25,15 +27,15 @@ protected:
     NEEDS(HasIpmiBed(), kIpmiBedNeeds);
     EnterNetworkNamespace();
     StartController();
-    relay_.emplace(623, kControllersPort, [](auto const&) { return TRelay::AtOnce(); });
+    fRelay.emplace(623, kControllersPort, [](auto const&) { return TRelay::AtOnce(); });
   }
 
   void StartController() {
-    simulator_.reset();
+    fSimulator.reset();
     TSimulator::TSettings settings;
     settings.port = kControllersPort;
-    simulator_.emplace(settings);
-    simulator_->WaitUntilReady();
+    fSimulator.emplace(settings);
+    fSimulator->WaitUntilReady();
   }
 
   static ipmi::TTarget Target() { return {"127.0.0.1", "623", "zepadmin", "zeppass1"}; }
@@ -58,20 +60,20 @@ protected:
   // What was sent after the first so many requests: "query" for one of version 1.5, else the kind of payload.
   std::vector<std::string> RequestsAfter(std::size_t first) const {
     std::map<int, std::string> const kinds = {{0, "message"}, {0x10, "open"}, {0x12, "RAKP 1"}, {0x14, "RAKP 3"}};
-    std::vector<std::string> found, all = relay_->Requests();
+    std::vector<std::string> found, all = fRelay->Requests();
     for (std::size_t n = first; n < all.size(); ++n) found.push_back(all[n][4] == 6 ? kinds.at(all[n][5] & 0x3F) : "query");
     return found;
   }
 
-  std::optional<TSimulator> simulator_;
-  std::optional<TRelay> relay_;
+  std::optional<TSimulator> fSimulator;
+  std::optional<TRelay> fRelay;
 };
 
 TEST_F(SessionTest, ASessionInUseStays) {
   ipmi::TSession session(Target(), Patient());
   session.Open();
   AddEvent(session);
-  std::size_t const before = relay_->Requests().size();
+  std::size_t const before = fRelay->Requests().size();
   AddEvent(session);
   EXPECT_THAT(RequestsAfter(before), ElementsAre("message"));
 }
@@ -79,7 +81,7 @@ TEST_F(SessionTest, ASessionInUseStays) {
 TEST_F(SessionTest, AnIdleSessionIsRenewedBeforeTheCommandIsSent) {
   ipmi::TSession session(Target(), IdleSoon(Patient()));
   session.Open();
-  std::size_t const before = relay_->Requests().size();
+  std::size_t const before = fRelay->Requests().size();
   std::this_thread::sleep_for(100ms);
   AddEvent(session);
   EXPECT_THAT(RequestsAfter(before), ElementsAre("message", "query", "open", "RAKP 1", "RAKP 3", "message", "message"))
@@ -97,8 +99,8 @@ TEST_F(SessionTest, AnIdleSessionThatTheControllerForgotIsRenewedToo) {
 }
 
 TEST_F(SessionTest, AControllerThatCalculatesForTwoSecondsIsNotAskedAgainMeanwhile) {
-  relay_.reset();
-  relay_.emplace(623, kControllersPort, [](TRelay::TDatagram const& datagram) {
+  fRelay.reset();
+  fRelay.emplace(623, kControllersPort, [](TRelay::TDatagram const& datagram) {
     constexpr unsigned char kProofOfPassword = 0x13;  // RAKP 2
     bool const isSlow = datagram.isAnswer && datagram.bytes[4] == 6 && (datagram.bytes[5] & 0x3F) == kProofOfPassword;
     return isSlow ? TRelay::TFate{2s} : TRelay::AtOnce();
@@ -110,18 +112,18 @@ TEST_F(SessionTest, AControllerThatCalculatesForTwoSecondsIsNotAskedAgainMeanwhi
 }
 
 TEST_F(SessionTest, AMessageThatIsTooLongForVersion15IsRefusedAndTheSessionGoesOn) {
-  relay_.reset();
-  relay_.emplace(623, kControllersPort, [](TRelay::TDatagram& datagram) {
+  fRelay.reset();
+  fRelay.emplace(623, kControllersPort, [](TRelay::TDatagram& datagram) {
     if (datagram.isAnswer) datagram.bytes = WithoutVersion2(datagram.bytes);
     return TRelay::AtOnce();
   });
   ipmi::TSession session(Target());
   session.Open();
-  std::size_t const before = relay_->Requests().size();
+  std::size_t const before = fRelay->Requests().size();
   EXPECT_THROW(session.Send(kStorage, kAddEvent, ipmi::TByteVector(255)), ipmi::TFailure);
-  EXPECT_EQ(relay_->Requests().size(), before);
+  EXPECT_EQ(fRelay->Requests().size(), before);
   AddEvent(session);
-  EXPECT_EQ(relay_->Requests().size(), before + 1) << "in the same session";
+  EXPECT_EQ(fRelay->Requests().size(), before + 1) << "in the same session";
 }
 
 // ---- What the simulator cannot do ----

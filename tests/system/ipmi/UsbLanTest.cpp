@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // ovdusblan.so on interfaces of a network namespace, and the whole way to controllers behind them.
 
 #include "IIPMILan.h"
@@ -31,28 +33,28 @@ protected:
   void SetUp() override {
     NEEDS(CanMakeNetworks(), "ip (package iproute2), and root");
     EnterNetworkNamespace();
-    library_.reset(::dlopen(ZEP_BUILD_DIR "/lib/ovdusblan.so", RTLD_LAZY));
-    ASSERT_TRUE(library_) << ::dlerror();
-    nodes_ = FunctionOf<decltype(GetNodes)>(library_.get(), "GetNodes");
-    query_ = FunctionOf<decltype(QueryOvdLanState)>(library_.get(), "QueryOvdLanState");
-    bringUp_ = FunctionOf<decltype(BringupOvdLan)>(library_.get(), "BringupOvdLan");
+    fLibrary.reset(::dlopen(ZEP_BUILD_DIR "/lib/ovdusblan.so", RTLD_LAZY));
+    ASSERT_TRUE(fLibrary) << ::dlerror();
+    fNodes = FunctionOf<decltype(GetNodes)>(fLibrary.get(), "GetNodes");
+    fQuery = FunctionOf<decltype(QueryOvdLanState)>(fLibrary.get(), "QueryOvdLanState");
+    fBringUp = FunctionOf<decltype(BringupOvdLan)>(fLibrary.get(), "BringupOvdLan");
   }
 
   static std::string AddressesOf(std::string const& interface) {
     return OutputOf("ip -4 -o addr show dev " + interface + " | awk '{print $4}' | tr '\\n' ' '");
   }
 
-  TEnvironmentGuard const named_{"ZEP_USBLAN_INTERFACES", nullptr};
-  TSharedLibrary library_;
-  decltype(&GetNodes) nodes_ = nullptr;
-  decltype(&QueryOvdLanState) query_ = nullptr;
-  decltype(&BringupOvdLan) bringUp_ = nullptr;
+  TEnvironmentGuard const fNamed{"ZEP_USBLAN_INTERFACES", nullptr};
+  TSharedLibrary fLibrary;
+  decltype(&GetNodes) fNodes = nullptr;
+  decltype(&QueryOvdLanState) fQuery = nullptr;
+  decltype(&BringupOvdLan) fBringUp = nullptr;
 };
 
 TEST_F(UsbLanTest, WithoutSuchAnInterfaceThereIsNoNode) {
   EXPECT_EQ(nodes_(), 0);
   EXPECT_EQ(query_(0), 0);
-  EXPECT_EQ(bringUp_(0), ENODEV);
+  EXPECT_EQ(fBringUp(0), ENODEV);
   EXPECT_EQ(AddressesOf("lo"), "127.0.0.1/8 ") << "loopback is left alone";
 }
 
@@ -61,18 +63,18 @@ TEST_F(UsbLanTest, AnInterfaceGetsAnAddressInTheControllersRange) {
   ::setenv("ZEP_USBLAN_INTERFACES", "bmc0 bmc1", 1);
   EXPECT_EQ(nodes_(), 2);
   EXPECT_EQ(query_(0), 0);
-  EXPECT_EQ(bringUp_(0), 0);
+  EXPECT_EQ(fBringUp(0), 0);
   EXPECT_EQ(query_(0), 1);
   EXPECT_EQ(query_(1), 0) << "the other is left alone";
   EXPECT_EQ(AddressesOf("bmc0"), "169.254.95.1/24 ");
   EXPECT_EQ(AddressesOf("bmc1"), "");
-  EXPECT_EQ(bringUp_(1), 0);
+  EXPECT_EQ(fBringUp(1), 0);
   EXPECT_EQ(AddressesOf("bmc1"), "169.254.96.1/24 ");
-  EXPECT_EQ(bringUp_(1), 0) << "once more changes nothing";
+  EXPECT_EQ(fBringUp(1), 0) << "once more changes nothing";
   EXPECT_EQ(AddressesOf("bmc1"), "169.254.96.1/24 ");
   for (int node : {-1, 2, 16, 2147483647}) {
     EXPECT_EQ(query_(node), 0) << node;
-    EXPECT_EQ(bringUp_(node), ENODEV) << node;
+    EXPECT_EQ(fBringUp(node), ENODEV) << node;
   }
 }
 
@@ -82,10 +84,10 @@ TEST_F(UsbLanTest, AMissingInterfaceMovesNoOtherToItsNode) {
   EXPECT_EQ(nodes_(), 4);
   for (int missing : {0, 2}) {
     EXPECT_EQ(query_(missing), 0) << missing;
-    EXPECT_EQ(bringUp_(missing), ENODEV) << missing;
+    EXPECT_EQ(fBringUp(missing), ENODEV) << missing;
   }
-  EXPECT_EQ(bringUp_(1), 0);
-  EXPECT_EQ(bringUp_(3), 0);
+  EXPECT_EQ(fBringUp(1), 0);
+  EXPECT_EQ(fBringUp(3), 0);
   EXPECT_EQ(AddressesOf("bmc0"), "169.254.96.1/24 ");
   EXPECT_EQ(AddressesOf("bmc1"), "169.254.98.1/24 ");
   EXPECT_EQ(AddressesOf("verylongname012"), "") << "its name is only the beginning of one that is missing";
@@ -96,13 +98,13 @@ TEST_F(UsbLanTest, OtherAddressesStay) {
       "ip link add bmc0 type veth peer name far0 && ip addr add 10.1.2.3/24 dev bmc0 && ip addr add 169.254.95.1/24 dev bmc0");
   ::setenv("ZEP_USBLAN_INTERFACES", "bmc0", 1);
   EXPECT_EQ(query_(0), 0) << "it is down";
-  EXPECT_EQ(bringUp_(0), 0) << "the address being there already";
+  EXPECT_EQ(fBringUp(0), 0) << "the address being there already";
   EXPECT_EQ(query_(0), 1);
   EXPECT_EQ(AddressesOf("bmc0"), "10.1.2.3/24 169.254.95.1/24 ");
 
   RunShell("ip addr flush dev bmc0 && ip addr add 169.254.7.8/16 dev bmc0");
   EXPECT_EQ(query_(0), 1) << "the whole range is reached";
-  EXPECT_EQ(bringUp_(0), 0);
+  EXPECT_EQ(fBringUp(0), 0);
   EXPECT_EQ(AddressesOf("bmc0"), "169.254.7.8/16 ");
 }
 
@@ -110,7 +112,7 @@ TEST_F(UsbLanTest, WithoutTheRightToConfigureItSaysSo) {
   RunShell("ip link add bmc0 type veth peer name far0");
   ::setenv("ZEP_USBLAN_INTERFACES", "bmc0", 1);
   pid_t const child = ::fork();
-  if (child == 0) ::_exit(::setuid(65534) != 0 ? 1 : bringUp_(0));
+  if (child == 0) ::_exit(::setuid(65534) != 0 ? 1 : fBringUp(0));
   int status = 0;
   ::waitpid(child, &status, 0);
   EXPECT_EQ(WEXITSTATUS(status), EPERM);

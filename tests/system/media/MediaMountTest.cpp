@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // MountDevice and UnmountDevice with real images. Regular files serve as devices here: mount takes a loop device by itself.
 
 #include "tests/system/media/MediaSupport.h"
@@ -27,18 +29,18 @@ class MediaMountTest : public testing::Test {
 protected:
   void SetUp() override {
     NEEDS_IMAGES();
-    MakeImage(dir_.Path("key"), "whole");
-    MakeImage(dir_.Path("part1"), "partition");  // of the "device" part, which itself cannot be mounted
-    WriteFile(dir_.Path("part"), std::string(4096, '\0'));
+    MakeImage(fDir.Path("key"), "whole");
+    MakeImage(fDir.Path("part1"), "partition");  // of the "device" part, which itself cannot be mounted
+    WriteFile(fDir.Path("part"), std::string(4096, '\0'));
   }
 
-  TTempDir dir_;
-  std::string const key_ = dir_.Path("key"), part_ = dir_.Path("part");
+  TTempDir fDir;
+  std::string const fKey = fDir.Path("key"), fPart = fDir.Path("part");
 };
 
 TEST_F(MediaMountTest, AWholeDeviceIsMountedAndUnmounted) {
   EXPECT_EQ(WithMountPoints([&] {
-              std::string text = TOSSpecific::MountDevice(key_);
+              std::string text = TOSSpecific::MountDevice(fKey);
               text += " " + ReadFile("/mnt/key/label.txt");
               TOSSpecific::UnmountDevice("whatever", "/mnt/key");
               return text + (TOSSpecific::FileExists("/mnt/key/label.txt") ? " mounted" : " unmounted");
@@ -48,7 +50,7 @@ TEST_F(MediaMountTest, AWholeDeviceIsMountedAndUnmounted) {
 
 TEST_F(MediaMountTest, AFirstPartitionIsMountedWhenTheDeviceHasNoFileSystem) {
   EXPECT_EQ(WithMountPoints([&] {
-              std::string const mountPoint = TOSSpecific::MountDevice(part_);
+              std::string const mountPoint = TOSSpecific::MountDevice(fPart);
               return mountPoint + " " + ReadFile("/mnt/key/label.txt");
             }),
             "/mnt/key partition");
@@ -56,9 +58,9 @@ TEST_F(MediaMountTest, AFirstPartitionIsMountedWhenTheDeviceHasNoFileSystem) {
 
 TEST_F(MediaMountTest, AMountedKeyStaysEvenForAnotherDevice) {
   EXPECT_EQ(WithMountPoints([&] {
-              TOSSpecific::MountDevice(key_);
+              TOSSpecific::MountDevice(fKey);
               std::string const mounts = ReadFile("/proc/self/mounts");
-              std::string const mountPoint = TOSSpecific::MountDevice(part_);
+              std::string const mountPoint = TOSSpecific::MountDevice(fPart);
               bool const isUnchanged = ReadFile("/proc/self/mounts") == mounts;
               return mountPoint + " " + ReadFile("/mnt/key/label.txt") + (isUnchanged ? " unchanged" : " changed");
             }),
@@ -67,7 +69,7 @@ TEST_F(MediaMountTest, AMountedKeyStaysEvenForAnotherDevice) {
 
 TEST_F(MediaMountTest, AKeyIsNoHindranceToAFloppy) {
   EXPECT_EQ(WithMountPoints([&] {
-              TOSSpecific::MountDevice(key_);
+              TOSSpecific::MountDevice(fKey);
               return StatusOf([] { TOSSpecific::MountDevice("/dev/fd1"); });  // there is none, and so it was tried
             }),
             "kZEPStatusFileSystemError");
@@ -81,9 +83,9 @@ TEST_F(MediaMountTest, WhatCannotBeMountedThrows) {
   };
   TRow const rows[] = {
       {"no file system", [] {}, "/dev/null"},
-      {"a device that is not there", [] {}, dir_.Path("nothing")},
-      {"a device that goes away", [&] { std::filesystem::remove(key_); }, key_},
-      {"no mount point", [] { std::filesystem::remove("/mnt/key"); }, key_},
+      {"a device that is not there", [] {}, fDir.Path("nothing")},
+      {"a device that goes away", [&] { std::filesystem::remove(fKey); }, fKey},
+      {"no mount point", [] { std::filesystem::remove("/mnt/key"); }, fKey},
   };
   for (TRow const& row : rows)
     EXPECT_EQ(WithMountPoints([&] {
@@ -97,7 +99,7 @@ TEST_F(MediaMountTest, WhatCannotBeMountedThrows) {
 TEST_F(MediaMountTest, ABusyMountPointAndOneWithoutMediumCannotBeUnmounted) {
   EXPECT_EQ(WithMountPoints([&] {
               std::string text = StatusOf([] { TOSSpecific::UnmountDevice("", "/mnt/key"); });
-              TOSSpecific::MountDevice(key_);
+              TOSSpecific::MountDevice(fKey);
               std::ifstream const user("/mnt/key/label.txt");
               text += " " + StatusOf([] { TOSSpecific::UnmountDevice("", "/mnt/key"); });
               return text + (TOSSpecific::FileExists("/mnt/key/label.txt") ? " mounted" : " unmounted");

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Does one operation on removable media and prints what came of it. Run in a virtual machine that has some.
 //
 //   MediaProbe virtual KIND KEEPWHOLE  the controller's virtual devices

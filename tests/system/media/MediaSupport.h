@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // Real media for tests: images on loop devices, mounted in a mount namespace of a child process.

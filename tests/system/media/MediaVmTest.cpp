@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Removable media for real: a virtual machine with a SCSI disk, a USB stick, a CD-ROM, a floppy drive and what a management
 // controller shows to its host. It is booted once and does everything (in-vm.sh); the tests look at what it left.
 

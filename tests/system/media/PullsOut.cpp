@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // To be preloaded: runs the shell command ZEP_PULL just before the ZEP_PULL_ATth fsync of the process.
 
 #include <dlfcn.h>

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep media and zep report --to-media on loop devices, and media that fail.
 
 #include "ZEPExport.h"
@@ -45,15 +47,15 @@ protected:
   std::string WithZep(TFunction function) {
     return InChild([&] {
       MakeMountPoints();
-      installation_.emplace();
+      fInstallation.emplace();
       std::string const text = function();
-      installation_.reset();
+      fInstallation.reset();
       return text;
     });
   }
 
   std::string Zep(std::vector<std::string> const& arguments) {
-    TRun const run = installation_->Run({arguments});
+    TRun const run = fInstallation->Run({arguments});
     return run.output + run.errors + "exit status " + std::to_string(run.status) + "\n";
   }
   std::string Report(std::string const& device, std::vector<std::string> arguments = {}) {
@@ -88,14 +90,14 @@ protected:
     return text;
   }
 
-  TTempDir dir_;
-  std::optional<TInstallation> installation_;
+  TTempDir fDir;
+  std::optional<TInstallation> fInstallation;
 };
 
 TEST_F(ZepMediaTest, MountsAndUnmounts) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
-              TLoopDevice const loop(dir_.Path("key"));
+              TLoopDevice const loop(fDir.Path("key"));
               std::string text = Zep({"media", "mount", loop.Path()});
               text += ReadFile("/mnt/key/label.txt") + "\n";
               text += Zep({"media", "mount", loop.Path()});
@@ -110,15 +112,15 @@ TEST_F(ZepMediaTest, MountsAndUnmounts) {
 }
 
 TEST_F(ZepMediaTest, MountsForACallerThatIgnoresItsChildren) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
-              TLoopDevice const loop(dir_.Path("key"));
+              TLoopDevice const loop(fDir.Path("key"));
               std::string text;
               for (std::vector<std::string> const& arguments :
                    {std::vector<std::string>{"media", "mount", loop.Path()}, {"media", "umount", "/mnt/key"}}) {
                 TCall call = {arguments};
                 call.ignoresChildren = true;
-                TRun const run = installation_->Run(call);
+                TRun const run = fInstallation->Run(call);
                 text += run.output + run.errors;
               }
               return Replaced(text, loop.Path(), "LOOP");
@@ -127,24 +129,24 @@ TEST_F(ZepMediaTest, MountsForACallerThatIgnoresItsChildren) {
 }
 
 TEST_F(ZepMediaTest, WithoutTheProgramMountThePackageIsNamed) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
-              TLoopDevice const loop(dir_.Path("key"));
+              TLoopDevice const loop(fDir.Path("key"));
               TCall call = {{"media", "mount", loop.Path()}};
-              call.environment = {{"PATH", dir_.Path()}};
-              TRun const run = installation_->Run(call);
+              call.environment = {{"PATH", fDir.Path()}};
+              TRun const run = fInstallation->Run(call);
               return run.errors + std::to_string(run.status);
             }),
             "zep: the program mount is missing; install the package mount\n1");
 }
 
 TEST_F(ZepMediaTest, MakesTheMountPointAndPrintsJson) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
               fs::remove("/mnt/key");
-              TLoopDevice const loop(dir_.Path("key"));
-              auto const mount = JsonOf(installation_->Run({{"media", "mount", loop.Path(), "--json"}}));
-              auto const unmount = JsonOf(installation_->Run({{"media", "umount", "/mnt/key", "--json"}}));
+              TLoopDevice const loop(fDir.Path("key"));
+              auto const mount = JsonOf(fInstallation->Run({{"media", "mount", loop.Path(), "--json"}}));
+              auto const unmount = JsonOf(fInstallation->Run({{"media", "umount", "/mnt/key", "--json"}}));
               ExpectEnvelope(mount, 0, "zep media mount");
               ExpectEnvelope(unmount, 0, "zep media umount");
               bool const isTheDevice = mount["device"] == loop.Path();
@@ -154,15 +156,15 @@ TEST_F(ZepMediaTest, MakesTheMountPointAndPrintsJson) {
 }
 
 TEST_F(ZepMediaTest, AnotherMediumAtTheMountPointIsNeverTakenForTheDevice) {
-  MakeImage(dir_.Path("first"), "first");
-  MakeImage(dir_.Path("second"), "second");
+  MakeImage(fDir.Path("first"), "first");
+  MakeImage(fDir.Path("second"), "second");
   EXPECT_EQ(WithZep([&] {
-              TLoopDevice const first(dir_.Path("first")), second(dir_.Path("second"));
+              TLoopDevice const first(fDir.Path("first")), second(fDir.Path("second"));
               Zep({"media", "mount", first.Path()});
               std::string text = Zep({"media", "mount", second.Path()});
               text += Report(second.Path());
               Do("umount /mnt/key");
-              return Replaced(text, first.Path(), "FIRST") + Joined(NamesIn(dir_.Path("first")));
+              return Replaced(text, first.Path(), "FIRST") + Joined(NamesIn(fDir.Path("first")));
             }),
             "zep: /mnt/key holds FIRST; unmount that first\nexit status 1\n"
             "zep: /mnt/key holds FIRST; unmount that first\nexit status 1\nlabel.txt");
@@ -206,12 +208,12 @@ private:
 };
 
 TEST_F(ZepMediaTest, AnotherDevicesPartitionIsNeverTakenForTheFirstOne) {
-  WriteFile(dir_.Path("none"), std::string(1 << 20, '\0'));
-  MakeImage(dir_.Path("other"), "other");
+  WriteFile(fDir.Path("none"), std::string(1 << 20, '\0'));
+  MakeImage(fDir.Path("other"), "other");
   EXPECT_EQ(
       WithZep([&] {
         TFakeDisks const disks;
-        TLoopDevice const none(dir_.Path("none")), other(dir_.Path("other"));
+        TLoopDevice const none(fDir.Path("none")), other(fDir.Path("other"));
         disks.AddNode("key1", none);
         disks.AddNode("key11", other);
         disks.AddPlace("key/key1", none);
@@ -235,11 +237,11 @@ TEST_F(ZepMediaTest, AnotherDevicesPartitionIsNeverTakenForTheFirstOne) {
 }
 
 TEST_F(ZepMediaTest, ADevicesOwnFirstPartitionWillDo) {
-  WriteFile(dir_.Path("none"), std::string(1 << 20, '\0'));
-  MakeImage(dir_.Path("part"), "partition");
+  WriteFile(fDir.Path("none"), std::string(1 << 20, '\0'));
+  MakeImage(fDir.Path("part"), "partition");
   EXPECT_EQ(WithZep([&] {
               TFakeDisks const disks;
-              TLoopDevice const none(dir_.Path("none")), part(dir_.Path("part"));
+              TLoopDevice const none(fDir.Path("none")), part(fDir.Path("part"));
               disks.AddNode("key", none);
               disks.AddNode("key1", part);
               disks.AddPlace("key", none);
@@ -255,22 +257,22 @@ TEST_F(ZepMediaTest, ADevicesOwnFirstPartitionWillDo) {
 }
 
 TEST_F(ZepMediaTest, AMediumThatIsMountedElsewhereTooCannotBeTakenOut) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
-              TLoopDevice const loop(dir_.Path("key"));
+              TLoopDevice const loop(fDir.Path("key"));
               fs::create_directory("/mnt/a");
               fs::create_directory("/mnt/b c");
               for (char const* directory : {"/mnt/a", "'/mnt/b c'"}) Do("mount " + loop.Path() + " " + directory);
               std::string text = Zep({"media", "mount", loop.Path()});
               text += Zep({"media", "umount", "/mnt/key"});
-              TRun const report = installation_->Run({{"report", "--sample", "--to-media", loop.Path()}});
+              TRun const report = fInstallation->Run({{"report", "--sample", "--to-media", loop.Path()}});
               text += "..." + report.output.substr(report.output.find(" on ")) + "exit status " + std::to_string(report.status) +
                       "\n";
               Do("umount '/mnt/b c'; mount " + loop.Path() + " /mnt/key");
-              TRun const unmounted = installation_->Run({{"media", "umount", "/mnt/key", "--json"}});
+              TRun const unmounted = fInstallation->Run({{"media", "umount", "/mnt/key", "--json"}});
               ExpectEnvelope(unmounted.output, 2, "zep media umount");
               text += JsonOf(unmounted)["stillMountedAt"].dump() + "\n";
-              TRun const asJson = installation_->Run({{"report", "--json", "--sample", "--to-media", loop.Path()}});
+              TRun const asJson = fInstallation->Run({{"report", "--json", "--sample", "--to-media", loop.Path()}});
               text += JsonOf(asJson)["stillMountedAt"].dump() + "\n";
               text += Zep({"media", "umount", "/mnt/a"});
               return Replaced(text, loop.Path(), "LOOP");
@@ -283,11 +285,11 @@ TEST_F(ZepMediaTest, AMediumThatIsMountedElsewhereTooCannotBeTakenOut) {
 }
 
 TEST_F(ZepMediaTest, AllPartitionsAndVolumesOfADriveAreTakenOutTogether) {
-  for (char const* name : {"first", "second", "volume", "stranger"}) MakeImage(dir_.Path(name), name);
+  for (char const* name : {"first", "second", "volume", "stranger"}) MakeImage(fDir.Path(name), name);
   EXPECT_EQ(WithZep([&] {
               TFakeDisks const disks;
-              TLoopDevice const first(dir_.Path("first")), second(dir_.Path("second")), volume(dir_.Path("volume"));
-              TLoopDevice const stranger(dir_.Path("stranger"));
+              TLoopDevice const first(fDir.Path("first")), second(fDir.Path("second")), volume(fDir.Path("volume"));
+              TLoopDevice const stranger(fDir.Path("stranger"));
               disks.AddPlace("key/key1", first);
               disks.AddPlace("key/key2", second);
               disks.AddPlace("other/other1", stranger);
@@ -310,18 +312,18 @@ TEST_F(ZepMediaTest, AllPartitionsAndVolumesOfADriveAreTakenOutTogether) {
 // ---- What cannot be done ----
 
 TEST_F(ZepMediaTest, WhatHasNoFileSystemCannotBeMounted) {
-  WriteFile(dir_.Path("key"), std::string(1 << 20, '\0'));
+  WriteFile(fDir.Path("key"), std::string(1 << 20, '\0'));
   EXPECT_EQ(WithZep([&] {
-              TLoopDevice const loop(dir_.Path("key"));
+              TLoopDevice const loop(fDir.Path("key"));
               return Replaced(Zep({"media", "mount", loop.Path()}), loop.Path(), "LOOP");
             }),
             "zep: LOOP cannot be mounted: neither it nor LOOP1 has a file system that can be read\nexit status 1\n");
 }
 
 TEST_F(ZepMediaTest, ABusyMediumCannotBeUnmounted) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
-              TLoopDevice const loop(dir_.Path("key"));
+              TLoopDevice const loop(fDir.Path("key"));
               Zep({"media", "mount", loop.Path()});
               std::string text;
               {
@@ -338,13 +340,13 @@ TEST_F(ZepMediaTest, ABusyMediumCannotBeUnmounted) {
 // ---- The report ----
 
 TEST_F(ZepMediaTest, AReportIsOnTheMediumWhenZepEnds) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
-              TLoopDevice const loop(dir_.Path("key"));
-              TRun const run = installation_->Run({{"report", "--sample", "--to-media", loop.Path()}});
+              TLoopDevice const loop(fDir.Path("key"));
+              TRun const run = fInstallation->Run({{"report", "--sample", "--to-media", loop.Path()}});
               EXPECT_EQ(run.status, 0) << run.errors;
               EXPECT_EQ(run.errors, "");
-              std::vector<std::string> names = NamesIn(dir_.Path("key"));  // the image itself, not the device
+              std::vector<std::string> names = NamesIn(fDir.Path("key"));  // the image itself, not the device
               std::sort(names.begin(), names.end());
               EXPECT_EQ(names.size(), 2u) << Joined(names);
               if (names.size() != 2) return "no report";
@@ -352,7 +354,7 @@ TEST_F(ZepMediaTest, AReportIsOnTheMediumWhenZepEnds) {
               EXPECT_EQ(run.output, "The report is " + names[1] + " on " + loop.Path() + ", which can be taken out.\n");
               EXPECT_THAT(ReadFile("/proc/self/mounts"), Not(HasSubstr("/mnt/key")));
 
-              Do("mount " + dir_.Path("key") + " /mnt/key");
+              Do("mount " + fDir.Path("key") + " /mnt/key");
               std::string const report = ReadFile("/mnt/key/" + names[1]);
               Do("umount /mnt/key");
               EXPECT_THAT(report, StartsWith("SAMPLE sample-server: "));
@@ -364,15 +366,15 @@ TEST_F(ZepMediaTest, AReportIsOnTheMediumWhenZepEnds) {
 }
 
 TEST_F(ZepMediaTest, AJsonReportIsAFileAndAnAnswer) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
-              TLoopDevice const loop(dir_.Path("key"));
-              TRun const run = installation_->Run({{"report", "--json", "--sample", "--to-media", loop.Path()}});
+              TLoopDevice const loop(fDir.Path("key"));
+              TRun const run = fInstallation->Run({{"report", "--json", "--sample", "--to-media", loop.Path()}});
               EXPECT_EQ(run.status, 0) << run.errors;
               auto const answer = JsonOf(run);
               ExpectEnvelope(answer, 0, "zep report --to-media");
               EXPECT_EQ(answer["device"], loop.Path());
-              Do("mount " + dir_.Path("key") + " /mnt/key");
+              Do("mount " + fDir.Path("key") + " /mnt/key");
               std::string const report = ReadFile("/mnt/key/" + answer["file"].get<std::string>());
               Do("umount /mnt/key");
               EXPECT_EQ(answer["bytes"], report.size());
@@ -391,14 +393,14 @@ void ExpectFailure(std::string const& text, std::string const& reason) {
 }
 
 TEST_F(ZepMediaTest, AFullMediumIsAFailure) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   std::string const text = WithZep([&] {
-    TLoopDevice const loop(dir_.Path("key"));
+    TLoopDevice const loop(fDir.Path("key"));
     Do("mount " + loop.Path() + " /mnt/key");
     RunProgram("dd if=/dev/zero of=/mnt/key/filler bs=1k 2>/dev/null");
     Do("umount /mnt/key");
     std::string const report = Report(loop.Path(), {"--json"});
-    return Replaced(report, loop.Path(), "LOOP") + Joined(NamesIn(dir_.Path("key"))) + " " +
+    return Replaced(report, loop.Path(), "LOOP") + Joined(NamesIn(fDir.Path("key"))) + " " +
            (fs::is_empty("/mnt/key") ? "unmounted" : "mounted");
   });
   ExpectFailure(text, "No space left on device");
@@ -406,11 +408,11 @@ TEST_F(ZepMediaTest, AFullMediumIsAFailure) {
 }
 
 TEST_F(ZepMediaTest, AReadOnlyMediumIsAFailure) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   std::string const text = WithZep([&] {
-    TLoopDevice const loop(dir_.Path("key"), "--read-only");
+    TLoopDevice const loop(fDir.Path("key"), "--read-only");
     std::string const report = Report(loop.Path());
-    return Replaced(report, loop.Path(), "LOOP") + Joined(NamesIn(dir_.Path("key"))) + " " +
+    return Replaced(report, loop.Path(), "LOOP") + Joined(NamesIn(fDir.Path("key"))) + " " +
            (fs::is_empty("/mnt/key") ? "unmounted" : "mounted");
   });
   ExpectFailure(text, "the medium is read-only");
@@ -435,21 +437,21 @@ TEST_F(ZepMediaTest, AMediumThatTakesNoDataIsAFailure) {
 
 // The kernel keeps a loop device that is in use until the last user goes, so that the report arrives all the same.
 TEST_F(ZepMediaTest, ALoopDeviceDetachedInTheMiddleStillGetsTheReport) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   std::string const text = WithZep([&] {
-    TLoopDevice const loop(dir_.Path("key"));
-    TRun const run = installation_->Run(
+    TLoopDevice const loop(fDir.Path("key"));
+    TRun const run = fInstallation->Run(
         {{"report", "--sample", "--to-media", loop.Path()},
          {{"LD_PRELOAD", ZEP_PULLS_OUT}, {"ZEP_PULL", "/usr/sbin/losetup --detach " + loop.Path()}, {"ZEP_PULL_AT", "1"}}});
-    return run.errors + "exit status " + std::to_string(run.status) + " " + Joined(NamesIn(dir_.Path("key")));
+    return run.errors + "exit status " + std::to_string(run.status) + " " + Joined(NamesIn(fDir.Path("key")));
   });
   EXPECT_THAT(text, StartsWith("exit status 0 label.txt zep-report-sample-server-"));
 }
 
 TEST_F(ZepMediaTest, AReportOnABusyMediumIsThereThoughItCannotBeUnmounted) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   std::string const text = WithZep([&] {
-    TLoopDevice const loop(dir_.Path("key"));
+    TLoopDevice const loop(fDir.Path("key"));
     Do("mount " + loop.Path() + " /mnt/key");
     std::string report;
     {
@@ -457,7 +459,7 @@ TEST_F(ZepMediaTest, AReportOnABusyMediumIsThereThoughItCannotBeUnmounted) {
       report = Report(loop.Path());
     }
     Do("umount /mnt/key");
-    return Replaced(report, loop.Path(), "LOOP") + Joined(NamesIn(dir_.Path("key")));
+    return Replaced(report, loop.Path(), "LOOP") + Joined(NamesIn(fDir.Path("key")));
   });
   EXPECT_THAT(text,
               testing::MatchesRegex("zep: (zep-report-sample-server-[0-9TZ]*\\.txt) is written on LOOP, but /mnt/key cannot be "
@@ -466,11 +468,11 @@ TEST_F(ZepMediaTest, AReportOnABusyMediumIsThereThoughItCannotBeUnmounted) {
 
 // Some file systems cannot be told to replace nothing.
 TEST_F(ZepMediaTest, NothingIsReplacedOnAnyFileSystem) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   for (int const error : {0, EINVAL, ENOSYS}) {
     SCOPED_TRACE(error);
     EXPECT_EQ(WithZep([&] {
-                TLoopDevice const loop(dir_.Path("key"));
+                TLoopDevice const loop(fDir.Path("key"));
                 TMountedMedium const medium(loop.Path());
                 gRenameError = error;
                 medium.Write("report", "first");
@@ -486,16 +488,16 @@ TEST_F(ZepMediaTest, NothingIsReplacedOnAnyFileSystem) {
                 fs::remove("/mnt/key/report");
                 fs::remove("/mnt/key/link");
                 UnmountDirectory("/mnt/key");
-                return Replaced(text, loop.Path(), "LOOP") + Joined(NamesIn(dir_.Path("key")));
+                return Replaced(text, loop.Path(), "LOOP") + Joined(NamesIn(fDir.Path("key")));
               }),
               "report cannot be written on LOOP: File exists\nlink cannot be written on LOOP: File exists\nfirst label.txt");
   }
 }
 
 TEST_F(ZepMediaTest, AnyOtherFailureToRenameIsOne) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
-              TLoopDevice const loop(dir_.Path("key"));
+              TLoopDevice const loop(fDir.Path("key"));
               TMountedMedium const medium(loop.Path());
               gRenameError = EIO;
               std::string text;
@@ -505,17 +507,17 @@ TEST_F(ZepMediaTest, AnyOtherFailureToRenameIsOne) {
                 text = failure.what();
               }
               UnmountDirectory("/mnt/key");
-              return Replaced(text, loop.Path(), "LOOP") + "\n" + Joined(NamesIn(dir_.Path("key")));
+              return Replaced(text, loop.Path(), "LOOP") + "\n" + Joined(NamesIn(fDir.Path("key")));
             }),
             "report cannot be written on LOOP: Input/output error\nlabel.txt");
 }
 
 TEST_F(ZepMediaTest, ADetachedLoopDeviceIsAFailure) {
-  MakeImage(dir_.Path("key"), "whole");
+  MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
-              TLoopDevice const loop(dir_.Path("key"));
+              TLoopDevice const loop(fDir.Path("key"));
               Do("/usr/sbin/losetup --detach " + loop.Path());
-              return Replaced(Report(loop.Path()), loop.Path(), "LOOP") + Joined(NamesIn(dir_.Path("key")));
+              return Replaced(Report(loop.Path()), loop.Path(), "LOOP") + Joined(NamesIn(fDir.Path("key")));
             }),
             "zep: LOOP cannot be mounted: neither it nor LOOP1 has a file system that can be read\nexit status 1\nlabel.txt");
 }

@@ -1,3 +1,5 @@
+# SPDX-License-Identifier: Apache-2.0
+
 # Run in the virtual machine: what the operations on removable media come to there. Each file in /out is looked at by one
 # test of MediaVmTest.cpp.
 #

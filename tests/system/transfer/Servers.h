@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // The servers that transfers are tested against: real ones on free ports of loopback, each started and ended by a test.
@@ -91,15 +92,15 @@ inline std::string WhyNoServer(std::string const& script) {
 class TServedTree {
 public:
   TServedTree() {
-    std::filesystem::permissions(dir_.Path(), std::filesystem::perms(0755));
-    std::filesystem::create_directory(dir_.Path("tree"));
+    std::filesystem::permissions(fDir.Path(), std::filesystem::perms(0755));
+    std::filesystem::create_directory(fDir.Path("tree"));
   }
-  std::string Path() const { return dir_.Path("tree"); }
-  std::string Path(std::string const& name) const { return dir_.Path("tree/" + name); }
-  std::string Beside(std::string const& name) const { return dir_.Path(name); }
+  std::string Path() const { return fDir.Path("tree"); }
+  std::string Path(std::string const& name) const { return fDir.Path("tree/" + name); }
+  std::string Beside(std::string const& name) const { return fDir.Path(name); }
 
 private:
-  TTempDir dir_;
+  TTempDir fDir;
 };
 
 // An FTP or SFTP server with a tree of its own. Users with the password "secret": "zep", who may do everything, and one who may

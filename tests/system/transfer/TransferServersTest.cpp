@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The transfer operations of the library with real servers: ProFTPD, sshd, and a proxy in front of a small web server.
 
 #include "tests/system/transfer/Servers.h"
@@ -41,22 +43,22 @@ protected:
   void SetUp() override {
     std::string const why = WhyNoServer(GetParam() + ".sh");
     NEEDS(why.empty(), why);
-    server_ = std::make_unique<TFileServer>(GetParam());
+    fServer = std::make_unique<TFileServer>(GetParam());
   }
 
   bool IsFtp() const { return GetParam() == "ftp"; }
   void Put(std::string const& url, std::string const& file) { TOSSpecific::CurlTransferFile(url, file, false); }
   void Get(std::string const& url, std::string const& file) { TOSSpecific::CurlTransferFile(url, file, true); }
-  std::string Url(std::string const& path) const { return server_->Url(path); }
-  std::string UrlAt(std::string const& port, std::string const& path) const { return server_->UrlAt(port, path); }
+  std::string Url(std::string const& path) const { return fServer->Url(path); }
+  std::string UrlAt(std::string const& port, std::string const& path) const { return fServer->UrlAt(port, path); }
   std::string LocalFile(std::string const& text) {
-    WriteFile(dir_.Path("local"), text);
-    return dir_.Path("local");
+    WriteFile(fDir.Path("local"), text);
+    return fDir.Path("local");
   }
-  std::string RemoteFile(std::string const& name) const { return server_->Tree().Path(name); }
+  std::string RemoteFile(std::string const& name) const { return fServer->Tree().Path(name); }
 
-  TTempDir dir_;
-  std::unique_ptr<TFileServer> server_;
+  TTempDir fDir;
+  std::unique_ptr<TFileServer> fServer;
 };
 
 TEST_P(FileServerTest, FilesGoThereAndBack) {
@@ -64,7 +66,7 @@ TEST_P(FileServerTest, FilesGoThereAndBack) {
   for (std::size_t const size : {0, 1, 16384, 16385, 100000000}) {
     SCOPED_TRACE(size);
     std::string const bytes = RandomBytes(size);
-    std::string const up = LocalFile(bytes), down = dir_.Path("down");
+    std::string const up = LocalFile(bytes), down = fDir.Path("down");
     Put(Url("file"), up);
     EXPECT_TRUE(ReadFile(RemoteFile("file")) == bytes);
     Get(Url("file"), down);
@@ -77,7 +79,7 @@ TEST_P(FileServerTest, FilesGoThereAndBack) {
 
 // Both open for reading, and their first byte fails.
 TEST_P(FileServerTest, AnUploadOfWhatCannotBeReadIsAccessDenied) {
-  for (std::string const& file : {dir_.Path(), std::string("/proc/self/mem")}) {
+  for (std::string const& file : {fDir.Path(), std::string("/proc/self/mem")}) {
     SCOPED_TRACE(file);
     ExpectFailure([&] { Put(Url("file"), file); }, kZEPStatusAccessDenied,
                   {kPerforming + "the local file cannot be read to its end"});
@@ -103,7 +105,7 @@ TEST_P(FileServerTest, MissingRemoteDirectoriesAreMade) {
 }
 
 TEST_P(FileServerTest, OperationsReachTheServer) {
-  std::string const file = LocalFile("text"), host = server_->Host();
+  std::string const file = LocalFile("text"), host = fServer->Host();
   {
     TEnvironmentGuard const guard("ZEP_ISBOOTABLE", "yes");
     IsFtp() ? TOSSpecific::FTPFile(host, file, "boot") : TOSSpecific::sFTPFile(host, file, "boot");
@@ -111,14 +113,14 @@ TEST_P(FileServerTest, OperationsReachTheServer) {
   EXPECT_EQ(ReadFile(RemoteFile("hostline/toqrv/vantor/fdr_upload/boot")), "text");
   IsFtp() ? TOSSpecific::FTPFile(host, file, "plain") : TOSSpecific::sFTPFile(host, file, "plain");
   EXPECT_EQ(ReadFile(RemoteFile("plain")), "text");
-  IsFtp() ? TOSSpecific::FTPFileFromQRV(host, dir_.Path("back"), "plain")
-          : TOSSpecific::sFTPFileFromQRV(host, dir_.Path("back"), "plain");
-  EXPECT_EQ(ReadFile(dir_.Path("back")), "text");
+  IsFtp() ? TOSSpecific::FTPFileFromQRV(host, fDir.Path("back"), "plain")
+          : TOSSpecific::sFTPFileFromQRV(host, fDir.Path("back"), "plain");
+  EXPECT_EQ(ReadFile(fDir.Path("back")), "text");
   if (IsFtp()) {
     TOSSpecific::UserFTPFile(host, file, "user");
     EXPECT_EQ(ReadFile(RemoteFile("user.xml.gz")), "text");
-    EXPECT_THAT(server_->Log(), HasSubstr("PASV"));
-    EXPECT_THAT(server_->Log(), Not(HasSubstr("EPSV")));
+    EXPECT_THAT(fServer->Log(), HasSubstr("PASV"));
+    EXPECT_THAT(fServer->Log(), Not(HasSubstr("EPSV")));
   }
 }
 
@@ -126,13 +128,13 @@ TEST_P(FileServerTest, RefusalsAreDenied) {
   std::string const file = LocalFile("text"), refused = IsFtp() ? "readonly" : "guest";
   fs::create_directory(RemoteFile("directory"));
   auto const UrlOf = [&](std::string const& user, std::string const& password, std::string const& path) {
-    return GetParam() + "://" + server_->Host(user, password) + "/" + path;
+    return GetParam() + "://" + fServer->Host(user, password) + "/" + path;
   };
   ExpectFailure([&] { Put(UrlOf("zep", "wrong", "f"), file); }, kZEPStatusAccessDenied,
                 {kPerforming + (IsFtp() ? "Access denied: 530" : "Authentication failure")});
-  ExpectFailure([&] { Get(UrlOf("nobody-knows", "secret", "f"), dir_.Path("down")); }, kZEPStatusAccessDenied,
+  ExpectFailure([&] { Get(UrlOf("nobody-knows", "secret", "f"), fDir.Path("down")); }, kZEPStatusAccessDenied,
                 {kPerforming + (IsFtp() ? "Access denied: 530" : "Authentication failure")});
-  ExpectFailure([&] { Get(Url("missing"), dir_.Path("down")); }, kZEPStatusAccessDenied,
+  ExpectFailure([&] { Get(Url("missing"), fDir.Path("down")); }, kZEPStatusAccessDenied,
                 {kPerforming +
                  (IsFtp() ? "The file does not exist" : "Could not open remote file for reading: No such file or directory")});
   ExpectFailure([&] { Put(UrlOf(refused, "secret", "f"), file); }, kZEPStatusAccessDenied,
@@ -141,20 +143,20 @@ TEST_P(FileServerTest, RefusalsAreDenied) {
                 {kPerforming + (IsFtp() ? "Failed to MKD dir: 550" : "Creating the dir/file failed: No such file or directory")});
   ExpectFailure([&] { Put(Url("directory"), file); }, kZEPStatusAccessDenied,
                 {kPerforming + (IsFtp() ? "Failed FTP upload: 550" : "Creating the dir/file failed: Operation failed")});
-  EXPECT_FALSE(fs::exists(dir_.Path("down")));
+  EXPECT_FALSE(fs::exists(fDir.Path("down")));
 }
 
 TEST_P(FileServerTest, ADownloadMakesMissingDirectoriesOnAnFtpServerToo) {
-  EXPECT_STATUS(Get(Url("new/directory/file"), dir_.Path("down")), kZEPStatusAccessDenied);
+  EXPECT_STATUS(Get(Url("new/directory/file"), fDir.Path("down")), kZEPStatusAccessDenied);
   EXPECT_EQ(fs::is_directory(RemoteFile("new/directory")), IsFtp());
 }
 
 TEST_P(FileServerTest, NobodyThereIsAFailedConnection) {
-  std::string const file = LocalFile("text"), port = server_->Port();
-  server_.reset();  // now nobody listens on that port
+  std::string const file = LocalFile("text"), port = fServer->Port();
+  fServer.reset();  // now nobody listens on that port
   std::string const unanswered = GetParam() + "://zep:secret@127.0.0.1:" + port + "/f";
   ExpectFailure([&] { Put(unanswered, file); }, kZEPStatusConnectionFailed, {kConnecting});
-  ExpectFailure([&] { Get(unanswered, dir_.Path("down")); }, kZEPStatusConnectionFailed, {kConnecting});
+  ExpectFailure([&] { Get(unanswered, fDir.Path("down")); }, kZEPStatusConnectionFailed, {kConnecting});
 
   // Without any network: an unknown name, and an address to which no way leads.
   for (char const* host : {"host.invalid", "192.0.2.1"}) {
@@ -173,10 +175,10 @@ TEST_P(FileServerTest, ACutConnectionIsDeniedAndThePartStays) {
   int const descriptors = OpenDescriptors();
   for (std::string const how : {"close", "reset"}) {
     SCOPED_TRACE(how);
-    std::vector<std::string> arguments = {"--how", how, "0", server_->Port(), "100000"};
+    std::vector<std::string> arguments = {"--how", how, "0", fServer->Port(), "100000"};
     if (IsFtp()) arguments.insert(arguments.begin(), {"--ftp", "--control"});
     TServer const relay("relay.py", arguments);
-    std::string const down = dir_.Path(how);
+    std::string const down = fDir.Path(how);
     EXPECT_STATUS(Get(UrlAt(relay.Port(), "big"), down), kZEPStatusAccessDenied);
     EXPECT_LE(ReadFile(down).size(), 100000u);
     EXPECT_EQ(ReadFile(down), bytes.substr(0, ReadFile(down).size()));
@@ -191,13 +193,13 @@ TEST_P(FileServerTest, AFullLocalDiskIsDenied) {
   // 65,636 bytes fit but for the last 100, which are still buffered when the last chunk was written.
   Put(Url("big"), LocalFile(RandomBytes(3000000)));
   Put(Url("tail"), LocalFile(RandomBytes(65636)));
-  fs::create_directory(dir_.Path("small"));
+  fs::create_directory(fDir.Path("small"));
   for (char const* name : {"big", "tail"}) {
     SCOPED_TRACE(name);
     std::string const outcome = InChild([&]() -> std::string {
-      if (!MountTmpfs(dir_.Path("small"), "size=64k")) return "no mount";
+      if (!MountTmpfs(fDir.Path("small"), "size=64k")) return "no mount";
       TLines log;
-      std::string const file = dir_.Path("small/file");
+      std::string const file = fDir.Path("small/file");
       log = LogOf([&] { EXPECT_STATUS(Get(Url(name), file), kZEPStatusAccessDenied); });
       return log.at(0) + ", " + std::to_string(fs::file_size(file)) + (testing::Test::HasFailure() ? ", wrong status" : "");
     });
@@ -258,10 +260,10 @@ protected:
   void SetUp() override {
     std::string const why = WhyNoServer("proxy.sh");
     NEEDS(why.empty(), why);
-    WriteFile(dir_.Path("page"), "<html>the page</html>");
-    proxy_ = std::make_unique<TServer>(
+    WriteFile(fDir.Path("page"), "<html>the page</html>");
+    fProxy = std::make_unique<TServer>(
         "proxy.sh", std::vector<std::string>{"0", "0"},
-        std::map<std::string, std::string>{{"WEB_PAGE", dir_.Path("page")}, {"WEB_LOG", dir_.Path("web.log")}});
+        std::map<std::string, std::string>{{"WEB_PAGE", fDir.Path("page")}, {"WEB_LOG", fDir.Path("web.log")}});
   }
 
   // The status of a check in a directory of its own, and what came back.
@@ -273,8 +275,8 @@ protected:
     return {status.TranslateStatusCode(), ReadFile("content.html")};
   }
 
-  TTempDir dir_;
-  std::unique_ptr<TServer> proxy_;
+  TTempDir fDir;
+  std::unique_ptr<TServer> fProxy;
 };
 
 // Of "http://www.example.com/" the host.
@@ -286,13 +288,13 @@ std::string PageHost() {
 
 TEST_F(ProxyServerTest, ThePageComesThroughTheProxy) {
   using testing::Pair;
-  EXPECT_THAT(Check("127.0.0.1", proxy_->Port(), "zep:secret"), Pair("kZEPStatusOK", "<html>the page</html>"));
-  EXPECT_THAT(ReadFile(dir_.Path("web.log")), testing::AllOf(HasSubstr("Host: " + PageHost()), HasSubstr("zep-test")));
+  EXPECT_THAT(Check("127.0.0.1", fProxy->Port(), "zep:secret"), Pair("kZEPStatusOK", "<html>the page</html>"));
+  EXPECT_THAT(ReadFile(fDir.Path("web.log")), testing::AllOf(HasSubstr("Host: " + PageHost()), HasSubstr("zep-test")));
 }
 
 TEST_F(ProxyServerTest, ARefusalIsSeenInTheContentOnly) {
   for (char const* userAndPassword : {"zep:wrong", "", "zep"}) {
-    auto const [status, content] = Check("127.0.0.1", proxy_->Port(), userAndPassword);
+    auto const [status, content] = Check("127.0.0.1", fProxy->Port(), userAndPassword);
     EXPECT_EQ(status, "kZEPStatusOK");
     EXPECT_THAT(content, testing::AnyOf(HasSubstr("407"), HasSubstr("401"))) << userAndPassword;
   }
@@ -300,8 +302,8 @@ TEST_F(ProxyServerTest, ARefusalIsSeenInTheContentOnly) {
 
 TEST_F(ProxyServerTest, NoProxyIsAFailedConnection) {
   using testing::Pair;
-  std::string const port = proxy_->Port();
-  proxy_.reset();
+  std::string const port = fProxy->Port();
+  fProxy.reset();
   EXPECT_THAT(LogOf([&] { EXPECT_THAT(Check("127.0.0.1", port, "zep:secret"), Pair("kZEPStatusConnectionFailed", "")); }),
               ElementsAre(testing::StartsWith("[Error] TOSSpecific|CheckProxySetting: curl_easy_perform FAILed;Failed to connect "
                                               "to 127.0.0.1 port " +

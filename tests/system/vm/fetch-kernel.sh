@@ -1,4 +1,6 @@
 #!/bin/sh
+# SPDX-License-Identifier: Apache-2.0
+#
 # Fetches a Debian kernel with its modules through apt and unpacks it (nothing
 # is installed) into the cache that run-in-vm.sh reads.
 #

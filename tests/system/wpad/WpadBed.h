@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // Commands beside a real DHCP server, in namespaces of their own (run-in-netns.sh).
@@ -45,12 +46,12 @@ protected:
     std::string output, errors;
   };
   TRun RunInside(std::string const& settings, std::string const& command) {
-    WriteFile(dir_.Path("command"), command);
+    WriteFile(fDir.Path("command"), command);
     std::string const call = "PATH=$PATH:/usr/sbin:/sbin PROBE=" WPAD_PROBE " ZEP=" TEST_BIN_DIR "/zep HURRY=" WPAD_HURRY " " +
                              settings + " timeout 60 " ZEP_SOURCE_DIR "/tests/system/wpad/run-in-netns.sh bash " +
-                             dir_.Path("command") + " < /dev/null > " + dir_.Path("out") + " 2> " + dir_.Path("err");
+                             fDir.Path("command") + " < /dev/null > " + fDir.Path("out") + " 2> " + fDir.Path("err");
     int const status = std::system(call.c_str());
-    return {WIFEXITED(status) ? WEXITSTATUS(status) : -1, ReadFile(dir_.Path("out")), ReadFile(dir_.Path("err"))};
+    return {WIFEXITED(status) ? WEXITSTATUS(status) : -1, ReadFile(fDir.Path("out")), ReadFile(fDir.Path("err"))};
   }
 
   // The same of a command that succeeds.
@@ -62,11 +63,11 @@ protected:
 
   // A file for the server "bytes".
   std::string ReplyFile(std::string const& hexadecimal) {
-    WriteFile(dir_.Path("reply"), hexadecimal);
-    return "WPAD_SERVER=bytes WPAD_REPLY=" + dir_.Path("reply") + " ";
+    WriteFile(fDir.Path("reply"), hexadecimal);
+    return "WPAD_SERVER=bytes WPAD_REPLY=" + fDir.Path("reply") + " ";
   }
 
-  TTempDir dir_;
+  TTempDir fDir;
 };
 
 }  // namespace NQRVZEP20

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The discovery of the web proxy beside real DHCP servers, in namespaces of their own (run-in-netns.sh). Where it does not
 // matter how long a wait is, WpadProbe waits a twentieth of it and says so: "(up to 6 s)".
 
@@ -256,8 +258,8 @@ TEST_F(WpadTest, TheAddressEndsAtItsPrefixLengthOrABlank) {
   for (std::string const shown : {"x inet6 addr: fd77::2/64 Scope:Link", "inet6 addr: fd77::2", "inet6 addr: fd77::2 /64",
                                   "inet6 addr: fd77::2/64\ninet6 addr: rubbish", "inet6 fe80::9\ninet6 addr: fd77::2\n"}) {
     SCOPED_TRACE(shown);
-    WriteFile(dir_.Path("shown"), shown);
-    TDiscovery const found = DiscoverInHurry("WPAD_URL=-", "mkdir /dev/shm/bin; printf '#!/bin/sh\\ncat " + dir_.Path("shown") +
+    WriteFile(fDir.Path("shown"), shown);
+    TDiscovery const found = DiscoverInHurry("WPAD_URL=-", "mkdir /dev/shm/bin; printf '#!/bin/sh\\ncat " + fDir.Path("shown") +
                                                                "' > /dev/shm/bin/ifconfig; chmod +x /dev/shm/bin/ifconfig\n"
                                                                "PATH=/dev/shm/bin:$PATH");
     EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kWaits + kShows + kAsks6 + kWaits);

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep wpad, as users run it, beside real DHCP servers.
 
 #include "tests/system/wpad/WpadBed.h"
@@ -112,9 +114,9 @@ std::string const kForgedLine =
 std::string const kDoesItLive = "; echo $?; kill -0 $victim && echo lives";
 
 TEST_F(ZepWpadTest, ALineThatNamesAnotherProcessIsRefused) {
-  std::string const settings = "TMPDIR=" + dir_.Path() + " ";
+  std::string const settings = "TMPDIR=" + fDir.Path() + " ";
   for (std::string const command : {"$ZEP wpad --yes", "echo y | $ZEP wpad"}) {
-    std::filesystem::remove_all(dir_.Path("bin"));
+    std::filesystem::remove_all(fDir.Path("bin"));
     TRun const run = Zep(settings, kForgedLine + command + kDoesItLive);
     EXPECT_EQ(run.output, "1\nlives\n");
     EXPECT_NE(std::regex_search(run.errors,
@@ -132,7 +134,7 @@ TEST_F(ZepWpadTest, ANumberWithLeadingZerosIsRefused) {
       "mkdir $TMPDIR/bin && export PATH=$TMPDIR/bin:$PATH; sleep 100 & victim=$!; "
       "printf '#!/bin/sh\necho \"0%s $(cat /proc/uptime) dhclient\"\nsleep 0.05\n' $victim > $TMPDIR/bin/ps; "
       "chmod +x $TMPDIR/bin/ps; ";
-  TRun const run = Zep("TMPDIR=" + dir_.Path() + " ", forging + "$ZEP wpad --yes" + kDoesItLive);
+  TRun const run = Zep("TMPDIR=" + fDir.Path() + " ", forging + "$ZEP wpad --yes" + kDoesItLive);
   EXPECT_EQ(run.output, "1\nlives\n");
   EXPECT_TRUE(
       std::regex_search(run.errors, std::regex("is wrong: 0[0-9]+ is not the number of a process\\. Nothing was ended\\.")))

@@ -1,4 +1,5 @@
 #!/usr/bin/env python3
+# SPDX-License-Identifier: Apache-2.0
 """Answers what comes to port 67 with the bytes of a file, whatever they are.
 
   answer.py HEXFILE SKIP

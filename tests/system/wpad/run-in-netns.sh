@@ -1,4 +1,6 @@
 #!/bin/bash
+# SPDX-License-Identifier: Apache-2.0
+#
 # Runs a command in a network namespace whose Ethernet interface, eth0, reaches a real DHCP server that knows option 252.
 # Needs root. Everything is torn down at the end.
 #

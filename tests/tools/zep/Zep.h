@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // zep as users have it: the real program, run as a child in a copy of what an installation lays side by side.
@@ -44,21 +45,21 @@ inline std::string WithoutSeconds(std::string const& text) {
 class TInstallation {
 public:
   TInstallation() {
-    fs::permissions(dir_.Path(), fs::perms::owner_all | fs::perms::group_exec | fs::perms::others_exec | fs::perms::others_read);
-    fs::create_directory(dir_.Path("lib"));
-    fs::create_directory(dir_.Path("bin"));
-    fs::copy(TEST_BIN_DIR "/zep", dir_.Path("bin/zep"));
+    fs::permissions(fDir.Path(), fs::perms::owner_all | fs::perms::group_exec | fs::perms::others_exec | fs::perms::others_read);
+    fs::create_directory(fDir.Path("lib"));
+    fs::create_directory(fDir.Path("bin"));
+    fs::copy(TEST_BIN_DIR "/zep", fDir.Path("bin/zep"));
     for (char const* library : {"libzepcore.so", "libsmbios.so", "libHost.nsp.so"})
       Add(library, std::string(TEST_LIB_DIR "/") + library);
-    fs::create_directories(dir_.Path("share/zepcore"));
-    fs::copy(TEST_SHARE_DIR "/zepcore", dir_.Path("share/zepcore"), fs::copy_options::recursive);
+    fs::create_directories(fDir.Path("share/zepcore"));
+    fs::copy(TEST_SHARE_DIR "/zepcore", fDir.Path("share/zepcore"), fs::copy_options::recursive);
   }
 
-  std::string Path(std::string const& name) const { return dir_.Path(name); }
+  std::string Path(std::string const& name) const { return fDir.Path(name); }
   void Add(std::string const& library, std::string const& source) {
-    fs::copy(source, dir_.Path("lib/" + library), fs::copy_options::overwrite_existing);
+    fs::copy(source, fDir.Path("lib/" + library), fs::copy_options::overwrite_existing);
   }
-  void Remove(std::string const& library) { fs::remove(dir_.Path("lib/" + library)); }
+  void Remove(std::string const& library) { fs::remove(fDir.Path("lib/" + library)); }
 
   // A table file for ZEP_SMBIOS_TABLE.
   std::string Table(std::string const& table) {
@@ -107,7 +108,7 @@ private:
     return ::geteuid() != 0 || (::setgroups(0, nullptr) == 0 && ::setgid(nobody) == 0 && ::setuid(nobody) == 0);
   }
 
-  TTempDir dir_;
+  TTempDir fDir;
 };
 
 inline nlohmann::json JsonOf(TRun const& run) { return nlohmann::json::parse(run.output); }

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep classes: the classes of the providers' namespaces, or of a schema.
 
 #include "tools/zep/ClassTree.h"

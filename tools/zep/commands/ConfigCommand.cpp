@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep config: the settings of zep.cfg as the library reads them.
 
 #include "TConfig.h"

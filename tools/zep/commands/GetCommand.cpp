@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep get: a file from an FTP or SFTP server.
 
 #include "tools/zep/commands/Commands.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep help: how zep, or one of its commands, is called.
 
 #include "tools/zep/commands/Commands.h"

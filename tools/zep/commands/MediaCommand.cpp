@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep media: the removable media of this machine.
 
 #include "tools/zep/commands/Commands.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep mof: loads and checks a schema.
 
 #include "ICIMClass.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/commands/MofFile.h"
 
 #include "providers/memory/TMemoryNamespace.h"

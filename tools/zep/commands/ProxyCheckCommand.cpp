@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep proxy-check: whether a web proxy lets a request through.
 
 #include "TOSSpecific.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep remote: the identity of remote servers, asked of their management controllers.
 
 #include "IIPMILan.h"

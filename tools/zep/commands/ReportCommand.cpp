@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep report: which machine this is.
 
 #include "tools/zep/Report.h"

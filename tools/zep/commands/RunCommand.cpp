@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep run: a command, run as the library runs one.
 
 #include "TOSSpecific.h"

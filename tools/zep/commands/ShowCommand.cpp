@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep show: one object or class, by its path.
 
 #include "ICIMClass.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep wpad: the address of the proxy configuration file, as the DHCP server of the local network names it.
 
 #include "AutoProxyDiscovery.h"

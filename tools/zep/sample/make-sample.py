@@ -1,4 +1,5 @@
 #!/usr/bin/env python3
+# SPDX-License-Identifier: Apache-2.0
 """Makes smbios.bin, the SMBIOS tables of an invented server, which `zep report --sample` reads.
 
     make-sample.py [FILE]         default: smbios.bin beside this script

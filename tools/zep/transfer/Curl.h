@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: Apache-2.0
 #pragma once
 
 // The limits to plain HTTP are set as every libcurl knows them; newer ones have another way as well.

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A stand-in for libsmbios.so, with the behaviour that the environment variable FAKE_SMBIOS names. Built with
 // FAKE_WITHOUT_NEXT it lacks smBiosGetNext, as a library may.
 

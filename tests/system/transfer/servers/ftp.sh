@@ -1,4 +1,6 @@
 #!/bin/bash
+# SPDX-License-Identifier: Apache-2.0
+#
 # A private FTP server (ProFTPD) on a loopback port.
 #
 #   ftp.sh PORT DIR [COMMAND [ARG...]]

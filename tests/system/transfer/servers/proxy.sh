@@ -1,4 +1,6 @@
 #!/bin/bash
+# SPDX-License-Identifier: Apache-2.0
+#
 # A private HTTP proxy (tinyproxy, with a password) and a tiny web server behind it,
 # both on loopback.
 #

@@ -1,4 +1,6 @@
 #!/bin/bash
+# SPDX-License-Identifier: Apache-2.0
+#
 # A private OpenSSH server that speaks SFTP only, on a loopback port. Needs root.
 #
 #   sftp.sh PORT DIR [COMMAND [ARG...]]

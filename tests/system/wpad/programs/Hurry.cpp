@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // To be preloaded: whoever waits by sleep or poll waits an eighth of the time.
 
 #include <dlfcn.h>

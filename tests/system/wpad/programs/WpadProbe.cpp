@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Runs the discovery, or the step that ends DHCP clients, and prints what came of it: the URL, how long it took, and what
 // was logged.
 //

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // What zep says of a command line that it does not take, for every command.
 
 #include "tests/tools/zep/Zep.h"
@@ -13,7 +15,7 @@ protected:
   TRun Run(std::vector<std::string> const& arguments) {
     TCall call = {arguments};
     call.hasNoTerminal = true;
-    return zep_.Run(call);
+    return fZep.Run(call);
   }
 
   void ExpectWrongUsage(std::vector<std::string> const& arguments, std::string const& why) {
@@ -24,7 +26,7 @@ protected:
     EXPECT_EQ(run.errors, "zep: " + why + "\n");
   }
 
-  TInstallation zep_;
+  TInstallation fZep;
 };
 
 TEST_F(ArgumentsTest, WhatIsWrongIsSaidWithoutTheWordsOfTheCommandLine) {
@@ -124,7 +126,7 @@ TEST_F(ArgumentsTest, HelpThatCannotBeWrittenIsAFailure) {
     SCOPED_TRACE(testing::PrintToString(arguments));
     TCall call = {arguments};
     call.outputFile = "/dev/full";
-    TRun const run = zep_.Run(call);
+    TRun const run = fZep.Run(call);
     EXPECT_EQ(run.status, 1);
     EXPECT_EQ(run.errors, "zep: standard output cannot be written: No space left on device\n");
     TRun const written = Run(arguments);

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep config, run as users run it.
 
 #include "tests/tools/zep/Zep.h"
@@ -14,15 +16,15 @@ protected:
     arguments.insert(arguments.begin(), "config");
     TCall call;
     call.arguments = arguments;
-    call.directory = dir_.Path();
+    call.directory = fDir.Path();
     call.asNobody = asNobody;
-    return zep_.Run(call);
+    return fZep.Run(call);
   }
   void Write(std::string const& text) { WriteFile(File(), text); }
-  std::string File() const { return dir_.Path("zep.cfg"); }
+  std::string File() const { return fDir.Path("zep.cfg"); }
 
-  TInstallation zep_;
-  TTempDir dir_;
+  TInstallation fZep;
+  TTempDir fDir;
 };
 
 std::string const kText =
@@ -110,7 +112,7 @@ TEST_F(ConfigTest, SaysWhyThereIsNothing) {
   EXPECT_EQ(run.output, "");
   EXPECT_EQ(run.errors, "zep: " + File() + " does not set \"b\"\n");
 
-  fs::permissions(dir_.Path(), fs::perms::all);
+  fs::permissions(fDir.Path(), fs::perms::all);
   fs::permissions(File(), fs::perms::none);
   run = Run({"--json"}, true);
   EXPECT_EQ(run.status, 1);
@@ -131,9 +133,9 @@ TEST_F(ConfigTest, AFileThatCannotBeReadToItsEndIsReportedAsSuch) {
   Write("a=1\n" + text);
   TCall call;
   call.arguments = {"config"};
-  call.directory = dir_.Path();
+  call.directory = fDir.Path();
   call.environment = {{"LD_PRELOAD", FAILING_READ}, {"ZEP_TEST_FAILING_FILE", File()}, {"ZEP_TEST_FAILING_BYTE", "50000"}};
-  TRun const run = zep_.Run(call);
+  TRun const run = fZep.Run(call);
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: " + File() + " cannot be read to its end, so that no setting of it is used\n");
 }

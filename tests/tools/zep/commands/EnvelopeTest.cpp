@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // The exit status and the JSON document of every command of zep, where it succeeds and where it fails.
 
 #include "tests/tools/zep/Envelope.h"
@@ -20,8 +22,8 @@ struct TRow {
 class EnvelopeTest : public testing::Test {
 protected:
   EnvelopeTest() {
-    fs::create_directory(zep_.Path("work"));
-    fs::create_directory(zep_.Path("empty"));
+    fs::create_directory(fZep.Path("work"));
+    fs::create_directory(fZep.Path("empty"));
     Write("zep.cfg", "a=1\n");
     Write("good.mof", "class X_A { uint32 A; };\n");
     Write("bad.mof", "class\n");
@@ -29,14 +31,14 @@ protected:
     Write("hosts", "one\ntwo\n");
   }
 
-  void Write(std::string const& name, std::string const& text) { WriteFile(zep_.Path("work/" + name), text); }
+  void Write(std::string const& name, std::string const& text) { WriteFile(fZep.Path("work/" + name), text); }
 
   TRun Run(std::vector<std::string> const& arguments, std::string const& directory = "work") {
     TCall call = {arguments};
     call.environment = {{"ZEP_SMBIOS_TABLE", "/nowhere"}, {"HOME", "/nowhere"}, {"NETRC", "/dev/null"}};
-    call.directory = zep_.Path(directory);
+    call.directory = fZep.Path(directory);
     call.hasNoTerminal = true;
-    return zep_.Run(call);
+    return fZep.Run(call);
   }
 
   void Expect(TRow const& row) {
@@ -91,7 +93,7 @@ protected:
     return missing;
   }
 
-  TInstallation zep_;
+  TInstallation fZep;
 };
 
 // A command that is missing here makes the test fail.
@@ -138,7 +140,7 @@ TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
 TEST_F(EnvelopeTest, WpadThatMayNotListenPrintsADocument) {
   TCall call = {{"wpad", "--json", "--no-stop"}};
   call.asNobody = true;
-  TRun const run = zep_.Run(call);
+  TRun const run = fZep.Run(call);
   EXPECT_EQ(run.status, 1);
   ExpectEnvelope(run.output, 1, "zep wpad");
 }
@@ -203,13 +205,13 @@ TEST_F(EnvelopeTest, EachHostOfAListHasADocumentOfItsOwnInALine) {
 
 TEST_F(EnvelopeTest, AReportThatIsNotSentSaysSoAndWhereItIsKept) {
   TCall call = {{"report", "--json", "--sample", "--send", "ftp://127.0.0.1:1/d/"}};
-  call.environment = {{"TMPDIR", zep_.Path("work")}, {"NETRC", "/dev/null"}};
-  TRun const run = zep_.Run(call);
+  call.environment = {{"TMPDIR", fZep.Path("work")}, {"NETRC", "/dev/null"}};
+  TRun const run = fZep.Run(call);
   EXPECT_EQ(run.status, 68);
   auto const document = JsonOf(run);
   EXPECT_EQ(document["status"], "complete");
   EXPECT_THAT(document["reason"].get<std::string>(), testing::StartsWith("it was not sent: "));
-  EXPECT_THAT(document["sent"]["keptIn"].get<std::string>(), testing::StartsWith(zep_.Path("work/zep-report.")));
+  EXPECT_THAT(document["sent"]["keptIn"].get<std::string>(), testing::StartsWith(fZep.Path("work/zep-report.")));
   EXPECT_TRUE(fs::exists(document["sent"]["keptIn"].get<std::string>()));
   EXPECT_TRUE(document["sent"]["sha256"].is_null());
 }
@@ -217,11 +219,11 @@ TEST_F(EnvelopeTest, AReportThatIsNotSentSaysSoAndWhereItIsKept) {
 TEST_F(EnvelopeTest, ADocumentThatCannotBeWrittenIsNotTriedTwice) {
   TCall call = {{"config", "--json"}};
   call.outputFile = "/dev/full";
-  TRun const run = zep_.Run(call);
+  TRun const run = fZep.Run(call);
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: standard output cannot be written: No space left on device\n");
   call.arguments.push_back("--no-such-option");
-  TRun const wrong = zep_.Run(call);
+  TRun const wrong = fZep.Run(call);
   EXPECT_EQ(wrong.status, 64);
   EXPECT_EQ(wrong.errors,
             "zep: there is no option --no-such-option\nzep: standard output cannot be written: No space left on device\n");

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep mof, zep classes and zep show over a MOF file, run as users run them.
 
 #include "tests/DmtfSchema.h"
@@ -32,16 +34,16 @@ class MofTest : public testing::Test {
 protected:
   MofTest() { WriteFile(File(), kSchema); }
 
-  std::string File() const { return zep_.Path("disks.mof"); }
+  std::string File() const { return fZep.Path("disks.mof"); }
   TRun Run(std::vector<std::string> const& arguments) {
     TCall call;
     call.arguments = arguments;
     call.environment = {{"ZEP_SMBIOS_TABLE", SamplePath()}, {"ZEP_HOST_NAME", "db1"}};
-    call.directory = zep_.Path("");
-    return zep_.Run(call);
+    call.directory = fZep.Path("");
+    return fZep.Run(call);
   }
 
-  TInstallation zep_;
+  TInstallation fZep;
 };
 
 // ---- zep mof ----
@@ -79,18 +81,18 @@ TEST_F(MofTest, WhatIsPrintedCanBeReadAndPrintsTheSame) {
   EXPECT_THAT(first.output,
               testing::StartsWith("Qualifier Abstract : boolean = FALSE,\n    Scope(class, association, indication)"));
   EXPECT_THAT(first.output, HasSubstr("[Association]\nclass X_Link {\n\n  [Key]\n  X_Device REF From;\n"));
-  WriteFile(zep_.Path("printed.mof"), first.output);
+  WriteFile(fZep.Path("printed.mof"), first.output);
   EXPECT_EQ(Run({"mof", "printed.mof", "--print"}).output, first.output);
 }
 
 TEST_F(MofTest, AMistakeIsToldWithItsPlace) {
-  WriteFile(zep_.Path("bad.mof"), "class X_A {\n  strin Name;\n};\n");
+  WriteFile(fZep.Path("bad.mof"), "class X_A {\n  strin Name;\n};\n");
   TRun const run = Run({"mof", "bad.mof"});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, "");
   EXPECT_EQ(run.errors, "zep: bad.mof:2:9: expected \"REF\" behind what is no type, found \"Name\"\n");
 
-  WriteFile(zep_.Path("bad.mof"), "class \x1b[31m");
+  WriteFile(fZep.Path("bad.mof"), "class \x1b[31m");
   EXPECT_EQ(Run({"mof", "bad.mof"}).errors, "zep: bad.mof:1:7: this character begins nothing that is known here\n");
   EXPECT_EQ(Run({"mof", "none.mof"}).errors, "zep: none.mof: cannot be read: No such file or directory\n");
   EXPECT_EQ(Run({"mof", "none.mof"}).status, 1);
@@ -159,17 +161,17 @@ TEST_F(MofTest, ClassesOfProvidersAreListed) {
 }
 
 TEST_F(MofTest, APlugInThatFailsMakesTheListPartial) {
-  zep_.Add("libBroken.nsp.so", File());
+  fZep.Add("libBroken.nsp.so", File());
   TRun const run = Run({"classes"});
   EXPECT_EQ(run.status, 2);
   EXPECT_THAT(run.errors, HasSubstr("zep: Broken: "));
   EXPECT_THAT(run.output, HasSubstr("\nCIM_Chassis\n"));
-  zep_.Remove("libHost.nsp.so");
+  fZep.Remove("libHost.nsp.so");
   EXPECT_EQ(Run({"classes"}).status, 1);
 }
 
 TEST_F(MofTest, NoClassIsAnError) {
-  WriteFile(zep_.Path("empty.mof"), "// nothing\n");
+  WriteFile(fZep.Path("empty.mof"), "// nothing\n");
   TRun const run = Run({"classes", "--mof", "empty.mof"});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, "");
@@ -263,16 +265,16 @@ TEST_F(MofTest, ThePageOnSchemasShowsWhatIsPrinted) {
   TCall call;
   call.arguments = {"mof", "examples/Disks/disks.mof"};
   call.directory = ZEP_SOURCE_DIR;
-  EXPECT_EQ(blocks[0], "$ zep mof examples/Disks/disks.mof\n" + zep_.Run(call).output);
+  EXPECT_EQ(blocks[0], "$ zep mof examples/Disks/disks.mof\n" + fZep.Run(call).output);
 
-  zep_.Add("libDisks.nsp.so", DISKS_PLUGIN);
-  zep_.Add("disks.mof", ZEP_SOURCE_DIR "/examples/Disks/disks.mof");
+  fZep.Add("libDisks.nsp.so", DISKS_PLUGIN);
+  fZep.Add("disks.mof", ZEP_SOURCE_DIR "/examples/Disks/disks.mof");
   EXPECT_EQ(blocks[1], "$ zep show 'X_Disk.Name=\"sda\"'\n" + Run({"show", "X_Disk.Name=\"sda\""}).output);
 }
 
 TEST_F(MofTest, AProviderWhoseSchemaIsWrongIsReportedWithThePlace) {
-  zep_.Add("libDisks.nsp.so", DISKS_PLUGIN);
-  WriteFile(zep_.Path("lib/disks.mof"), "class X_Disk {");
+  fZep.Add("libDisks.nsp.so", DISKS_PLUGIN);
+  WriteFile(fZep.Path("lib/disks.mof"), "class X_Disk {");
   TRun const run = Run({"classes"});
   EXPECT_EQ(run.status, 2);
   EXPECT_THAT(run.errors, testing::StartsWith("zep: Disks: "));

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep report, run as users run it.
 
 #include "tests/tools/zep/Zep.h"
@@ -86,16 +88,16 @@ protected:
     call.arguments.insert(call.arguments.end(), options.begin(), options.end());
     call.environment = std::move(environment);
     call.environment["ZEP_HOST_NAME"] = "db1";
-    return zep_.Run(call);
+    return fZep.Run(call);
   }
 
   // Adds the test provider, with that behaviour.
   TRun RunWithTestProvider(std::string const& behaviour, std::vector<std::string> const& options = {}) {
-    zep_.Add("libTest.nsp.so", TEST_PROVIDER);
+    fZep.Add("libTest.nsp.so", TEST_PROVIDER);
     return Run(options, {{"ZEP_SMBIOS_TABLE", RealTablePath("full")}, {"ZEP_TEST_PROVIDER", behaviour}});
   }
 
-  TInstallation zep_;
+  TInstallation fZep;
 };
 
 // ---- What is told ----
@@ -155,7 +157,7 @@ TEST_F(ReportTest, EachRowHasItsValueOrItsReason) {
 }
 
 TEST_F(ReportTest, AProductNameWithoutModelTellsSo) {
-  TRun const run = Report(zep_.Table(SystemInformation("Server X1-[1234]-", "KQ12345") + EndOfTable()));
+  TRun const run = Report(fZep.Table(SystemInformation("Server X1-[1234]-", "KQ12345") + EndOfTable()));
   EXPECT_EQ(run.status, 2);
   EXPECT_EQ(ValueIn(run.output, "Machine type"), "1234");
   EXPECT_EQ(ValueIn(run.output, "Model"), "unknown: the product name tells the machine type only");
@@ -186,7 +188,7 @@ TEST_F(ReportTest, TheSerialNumberOfEveryMakersFormIsShownAndTheIdentityComplete
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.serialNumber);
-    std::string const table = zep_.Table(SystemInformation(row.productName, row.serialNumber) + EndOfTable());
+    std::string const table = fZep.Table(SystemInformation(row.productName, row.serialNumber) + EndOfTable());
     std::string const note = "not in the collector's own form: 7 letters and digits";
     TRun const text = Report(table);
     EXPECT_EQ(text.status, 0);
@@ -213,7 +215,7 @@ TEST_F(ReportTest, TheSerialNumberOfEveryMakersFormIsShownAndTheIdentityComplete
 }
 
 TEST_F(ReportTest, ASerialNumberOfAnotherFormCompletesTheIdentityOfAnOwnMachine) {
-  TRun const run = Report(zep_.Table(SystemInformation("Server Q100 -[1234AB7]-", "9000116105") + EndOfTable()));
+  TRun const run = Report(fZep.Table(SystemInformation("Server Q100 -[1234AB7]-", "9000116105") + EndOfTable()));
   EXPECT_EQ(run.status, 0);
   EXPECT_EQ(LinesOf(run.output)[0], "db1: Server Q100, type 1234, model AB7, serial number 9000116105");
 }
@@ -234,7 +236,7 @@ TEST_F(ReportTest, OnlyAProductNameWithoutBracketsExplainsThatThereIsNoTypeAndMo
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.productName);
-    std::string const table = zep_.Table(SystemInformation(row.productName, "KQ12345") + EndOfTable());
+    std::string const table = fZep.Table(SystemInformation(row.productName, "KQ12345") + EndOfTable());
     TRun const run = Report(table, {"--json"});
     EXPECT_EQ(run.status, row.status);
     auto const document = JsonOf(run);
@@ -248,7 +250,7 @@ TEST_F(ReportTest, OnlyAProductNameWithoutBracketsExplainsThatThereIsNoTypeAndMo
 }
 
 TEST_F(ReportTest, PlaceholdersOfTheFirmwareAreToldAsSuch) {
-  TRun const run = Report(zep_.Table(SystemInformation("To Be Filled By O.E.M.", "System Serial Number") + EndOfTable()));
+  TRun const run = Report(fZep.Table(SystemInformation("To Be Filled By O.E.M.", "System Serial Number") + EndOfTable()));
   EXPECT_EQ(run.status, 2);
   EXPECT_EQ(ValueIn(run.output, "Product name"), "unknown: placeholder text of the firmware: \"To Be Filled By O.E.M.\"");
   EXPECT_EQ(ValueIn(run.output, "Machine type"), "unknown: placeholder text of the firmware: \"To Be Filled By O.E.M.\"");
@@ -263,7 +265,7 @@ TEST_F(ReportTest, ASerialNumberThatWasNeverWrittenIsMissing) {
       {" - ", "placeholder", "unknown: placeholder text of the firmware: \" - \""},
   };
   for (TRow const& row : rows) {
-    std::string const table = zep_.Table(SystemInformation("Rackhost R5200", row.serialNumber) + EndOfTable());
+    std::string const table = fZep.Table(SystemInformation("Rackhost R5200", row.serialNumber) + EndOfTable());
     EXPECT_EQ(JsonOf(Report(table, {"--json"}))["identity"]["serialNumber"]["code"], row.code);
     EXPECT_EQ(WithoutBlanks(ValueIn(Report(table).output, "Serial number")), WithoutBlanks(row.shown));
   }
@@ -274,7 +276,7 @@ TEST_F(ReportTest, TwoKindsOfProcessorAndModulesOfUnknownSizeAreToldApart) {
       "\0\3\1\0"s + std::string(8, '\0') + "\1"s + std::string(7, '\0') + "\x41"s + std::string(23, '\0');
   std::string const module = std::string(8, '\0') + "\0\2"s + std::string(20, '\0');
   std::string const unknownModule = std::string(8, '\0') + "\xff\xff"s + std::string(20, '\0');
-  TRun const run = Report(zep_.Table(Structure(4, processor, {"Kind B"}) + Structure(4, processor, {"Kind A"}) +
+  TRun const run = Report(fZep.Table(Structure(4, processor, {"Kind B"}) + Structure(4, processor, {"Kind A"}) +
                                      Structure(4, processor, {"Kind A"}) + Structure(17, module) + Structure(17, unknownModule) +
                                      EndOfTable()));
   EXPECT_EQ(ValueIn(run.output, "Processors"), "2 x Kind A, 1 x Kind B");
@@ -284,31 +286,31 @@ TEST_F(ReportTest, TwoKindsOfProcessorAndModulesOfUnknownSizeAreToldApart) {
 // ---- Why there are no tables ----
 
 TEST_F(ReportTest, ATableFileThatCannotBeReadSaysWhy) {
-  TRun const missing = Report(zep_.Path("nothing"));
+  TRun const missing = Report(fZep.Path("nothing"));
   EXPECT_EQ(missing.status, 2);
-  EXPECT_EQ(LinesOf(missing.output)[0], "db1: not identified: the SMBIOS table file " + zep_.Path("nothing") + " does not exist");
+  EXPECT_EQ(LinesOf(missing.output)[0], "db1: not identified: the SMBIOS table file " + fZep.Path("nothing") + " does not exist");
 
-  TRun const garbage = Report(zep_.Table("_SM_ and no more"));
+  TRun const garbage = Report(fZep.Table("_SM_ and no more"));
   EXPECT_EQ(garbage.status, 2);
   EXPECT_THAT(LinesOf(garbage.output)[0], EndsWith(" holds no SMBIOS table"));
 }
 
 TEST_F(ReportTest, ATableFileOfAnotherUserSaysWhy) {
-  std::string const table = zep_.Table(RealTable("full"));
+  std::string const table = fZep.Table(RealTable("full"));
   fs::permissions(table, fs::perms::owner_all);
   if (::geteuid() != 0) fs::permissions(table, fs::perms::none);
   TCall call;
   call.arguments = {"report"};
   call.environment = {{"ZEP_SMBIOS_TABLE", table}, {"ZEP_HOST_NAME", "db1"}};
   call.asNobody = true;
-  TRun const run = zep_.Run(call);
+  TRun const run = fZep.Run(call);
   EXPECT_EQ(run.status, 2);
   ASSERT_FALSE(run.output.empty());
   EXPECT_EQ(LinesOf(run.output)[0], "db1: not identified: the SMBIOS table file " + table + " may not be read by this user");
 }
 
 TEST_F(ReportTest, TheSystemsOwnTablesSayWhyTheyCannotBeRead) {
-  zep_.Add("libsmbios.so", FAKE_SMBIOS);
+  fZep.Add("libsmbios.so", FAKE_SMBIOS);
   struct TRow {
     char const *behaviour, *machine, *code;
   } const rows[] = {
@@ -331,7 +333,7 @@ TEST_F(ReportTest, TheSystemsOwnTablesSayWhyTheyCannotBeRead) {
 }
 
 TEST_F(ReportTest, WithoutTheSmbiosLibraryTheLinkersReasonIsTold) {
-  zep_.Remove("libsmbios.so");
+  fZep.Remove("libsmbios.so");
   TRun const run = Run({}, {});
   EXPECT_EQ(run.status, 2);
   EXPECT_THAT(LinesOf(run.output)[0], AllOf(StartsWith("db1: not identified: the SMBIOS library cannot be loaded: libsmbios.so"),
@@ -372,7 +374,7 @@ TEST_F(ReportTest, JsonAgreesWithTheText) {
     EXPECT_EQ(compared, 19u);
     ASSERT_EQ(document["plugIns"].size(), 1u);
     EXPECT_EQ(document["plugIns"][0]["name"], "Host");
-    EXPECT_EQ(document["plugIns"][0]["file"], zep_.Path("lib/libHost.nsp.so"));
+    EXPECT_EQ(document["plugIns"][0]["file"], fZep.Path("lib/libHost.nsp.so"));
     EXPECT_TRUE(document["plugIns"][0]["error"].is_null());
     EXPECT_EQ(document["plugIns"][0]["providers"][0]["namespace"], "root/zep/host");
   }
@@ -418,7 +420,7 @@ TEST_F(ReportTest, JsonTellsWhyAPropertyIsNull) {
 // ---- The sample ----
 
 TEST_F(ReportTest, TheSampleIsLabelledInEveryLineOfTheText) {
-  TRun const run = zep_.Run({{"report", "--sample"}});
+  TRun const run = fZep.Run({{"report", "--sample"}});
   EXPECT_EQ(run.status, 0);
   EXPECT_EQ(run.errors, "");
   auto const lines = LinesOf(run.output);
@@ -436,7 +438,7 @@ TEST_F(ReportTest, TheSampleIsLabelledInEveryLineOfTheText) {
 }
 
 TEST_F(ReportTest, TheSampleIsLabelledInJson) {
-  auto const document = JsonOf(zep_.Run({{"report", "--sample", "--json"}}));
+  auto const document = JsonOf(fZep.Run({{"report", "--sample", "--json"}}));
   EXPECT_EQ(document["sample"], true);
   EXPECT_EQ(document["label"], "SAMPLE");
   EXPECT_EQ(document["status"], "complete");
@@ -460,7 +462,7 @@ TEST_F(ReportTest, TheSampleHidesThisMachinesNameAndTheCallersTable) {
   TCall call;
   call.arguments = {"report", "--sample", "--json"};
   call.environment = {{"ZEP_SMBIOS_TABLE", RealTablePath("bare7")}, {"ZEP_HOST_NAME", "db1"}};
-  TRun const run = zep_.Run(call);
+  TRun const run = fZep.Run(call);
   EXPECT_THAT(run.output, Not(HasSubstr("\"" + std::string(name) + "\"")));
   EXPECT_THAT(run.output, Not(HasSubstr("db1")));
   EXPECT_EQ(JsonOf(run)["identity"]["productName"]["value"], "Server Q100 -[1234AB7]-");
@@ -468,17 +470,17 @@ TEST_F(ReportTest, TheSampleHidesThisMachinesNameAndTheCallersTable) {
 }
 
 TEST_F(ReportTest, ASampleThatIsNotInstalledIsAnError) {
-  fs::remove_all(zep_.Path("share"));
-  TRun const run = zep_.Run({{"report", "--sample"}});
+  fs::remove_all(fZep.Path("share"));
+  TRun const run = fZep.Run({{"report", "--sample"}});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: the sample is not installed: " + zep_.Path("share/zepcore/sample/smbios.bin") + " is missing\n");
+  EXPECT_EQ(run.errors, "zep: the sample is not installed: " + fZep.Path("share/zepcore/sample/smbios.bin") + " is missing\n");
 }
 
 // ---- Plug-ins ----
 
 TEST_F(ReportTest, WithoutPlugInsNothingIsTold) {
-  zep_.Remove("libHost.nsp.so");
+  fZep.Remove("libHost.nsp.so");
   TRun const run = Report(RealTablePath("full"));
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(LinesOf(run.output)[0], "Unnamed machine: not identified: no provider plug-in found");
@@ -490,7 +492,7 @@ TEST_F(ReportTest, WithoutPlugInsNothingIsTold) {
     }
   ASSERT_EQ(PlugInRowsOf(run.output).size(), 1u);
   EXPECT_EQ(PlugInRowsOf(run.output)[0][0], "none");
-  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(run.output)[0][2]), WithoutBlanks("no file lib*.nsp.so in " + zep_.Path("lib")));
+  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(run.output)[0][2]), WithoutBlanks("no file lib*.nsp.so in " + fZep.Path("lib")));
 
   TRun const json = Report(RealTablePath("full"), {"--json"});
   EXPECT_EQ(json.status, 1);
@@ -502,7 +504,7 @@ TEST_F(ReportTest, WithoutPlugInsNothingIsTold) {
 }
 
 TEST_F(ReportTest, ABrokenPlugInIsToldWithTheLinkersReasonAndStopsNoOther) {
-  WriteFile(zep_.Path("lib/libBroken.nsp.so"), "this is no library");
+  WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
   TRun const run = Report(RealTablePath("full"));
   EXPECT_EQ(run.status, 2);
   EXPECT_EQ(run.errors, "");
@@ -511,19 +513,19 @@ TEST_F(ReportTest, ABrokenPlugInIsToldWithTheLinkersReasonAndStopsNoOther) {
   ASSERT_EQ(rows.size(), 2u);
   EXPECT_EQ(rows[0][0], "Broken");
   EXPECT_THAT(rows[0][1], testing::MatchesRegex("[0-9]+\\.[0-9] ms"));
-  EXPECT_EQ(WithoutBlanks(rows[0][2]), WithoutBlanks("failed: " + zep_.Path("bin/../lib/libBroken.nsp.so") + ": file too short"));
+  EXPECT_EQ(WithoutBlanks(rows[0][2]), WithoutBlanks("failed: " + fZep.Path("bin/../lib/libBroken.nsp.so") + ": file too short"));
   EXPECT_EQ(rows[1][0], "Host");
   EXPECT_EQ(rows[1][2], "filled root/zep/host");
 
   auto const plugIn = JsonOf(Report(RealTablePath("full"), {"--json"}))["plugIns"][0];
-  EXPECT_EQ(plugIn["error"], zep_.Path("bin/../lib/libBroken.nsp.so") + ": file too short");
-  EXPECT_EQ(plugIn["file"], zep_.Path("lib/libBroken.nsp.so"));
+  EXPECT_EQ(plugIn["error"], fZep.Path("bin/../lib/libBroken.nsp.so") + ": file too short");
+  EXPECT_EQ(plugIn["file"], fZep.Path("lib/libBroken.nsp.so"));
   EXPECT_THAT(plugIn["providers"], IsEmpty());
 }
 
 TEST_F(ReportTest, ABrokenPlugInAloneTellsNothing) {
-  zep_.Remove("libHost.nsp.so");
-  WriteFile(zep_.Path("lib/libBroken.nsp.so"), "this is no library");
+  fZep.Remove("libHost.nsp.so");
+  WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
   TRun const run = Report(RealTablePath("full"));
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(LinesOf(run.output)[0], "Unnamed machine: not identified: no provider plug-in works");
@@ -563,7 +565,7 @@ TEST_F(ReportTest, WhatTheLogSaysOfAFailureIsToldWithIt) {
 }
 
 TEST_F(ReportTest, ANamespaceThatFailsLaterIsToldWhereItFails) {
-  zep_.Remove("libHost.nsp.so");
+  fZep.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("fails-later");
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: provider Test failed: kZEPStatusFail");
@@ -591,7 +593,7 @@ TEST_F(ReportTest, WhatPlugInsPrintDoesNotGetIntoTheDocument) {
 
 TEST_F(ReportTest, TheFirstProviderThatKnowsAnswers) {
   EXPECT_EQ(ValueIn(RunWithTestProvider("one-system").output, "Host name"), "db1");
-  zep_.Remove("libHost.nsp.so");
+  fZep.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("one-system");
   EXPECT_EQ(run.status, 2);
   EXPECT_EQ(LinesOf(run.output)[0], "one: 1234AB7, type 1234, model AB7, serial number KQ12345");
@@ -600,7 +602,7 @@ TEST_F(ReportTest, TheFirstProviderThatKnowsAnswers) {
 }
 
 TEST_F(ReportTest, TwoSystemsAreNotOneIdentity) {
-  zep_.Remove("libHost.nsp.so");
+  fZep.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("two-systems");
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: the provider describes 2 of them");
@@ -609,7 +611,7 @@ TEST_F(ReportTest, TwoSystemsAreNotOneIdentity) {
 // ---- Foreign bytes ----
 
 TEST_F(ReportTest, WhatTheFirmwareSaysCannotControlTheTerminal) {
-  std::string const table = zep_.Table(SystemInformation("\x1b]0;owned\x07\x1b[2J\xff Q \xc3\xa9 \xe2\x80\xae -[1234AB7]-",
+  std::string const table = fZep.Table(SystemInformation("\x1b]0;owned\x07\x1b[2J\xff Q \xc3\xa9 \xe2\x80\xae -[1234AB7]-",
                                                          "\x9b"
                                                          "31m\n\t") +
                                        EndOfTable());
@@ -648,9 +650,9 @@ TEST_F(ReportTest, OddValuesOfAProviderMakeOneValidDocument) {
 }
 
 TEST_F(ReportTest, TablesFitIntoEightyColumns) {
-  WriteFile(zep_.Path("lib/libBroken.nsp.so"), "this is no library");
-  for (TRun const& run : {Report(zep_.Table(SystemInformation(std::string(300, 'x'), std::string(200, 'y')) + EndOfTable())),
-                          zep_.Run({{"report", "--sample"}}), Run({}, {})}) {
+  WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
+  for (TRun const& run : {Report(fZep.Table(SystemInformation(std::string(300, 'x'), std::string(200, 'y')) + EndOfTable())),
+                          fZep.Run({{"report", "--sample"}}), Run({}, {})}) {
     auto const lines = LinesOf(run.output);
     bool isTable = false;  // the head lines stand alone, in front of the first empty one
     for (std::string const& line : lines) {
@@ -670,12 +672,12 @@ TEST_F(ReportTest, AReaderWhoWentAwayEndsItQuietly) {
   TCall call;
   call.arguments = {"report", "--sample"};
   call.outputDescriptor = ends[1];
-  TRun const run = zep_.Run(call);
+  TRun const run = fZep.Run(call);
   EXPECT_EQ(run.status, 128 + SIGPIPE);
   EXPECT_EQ(run.errors, "");
 
   call.ignoresBrokenPipes = true;
-  TRun const ignoring = zep_.Run(call);
+  TRun const ignoring = fZep.Run(call);
   EXPECT_EQ(ignoring.status, 1);
   EXPECT_EQ(ignoring.errors, "zep: standard output cannot be written: Broken pipe\n");
   ::close(ends[1]);
@@ -686,7 +688,7 @@ TEST_F(ReportTest, AFullDiskIsAnError) {
   TCall call;
   call.arguments = {"report", "--json", "--sample"};
   call.outputFile = "/dev/full";
-  TRun const run = zep_.Run(call);
+  TRun const run = fZep.Run(call);
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: standard output cannot be written: No space left on device\n");
 }
@@ -707,7 +709,7 @@ TEST_F(ReportTest, WrongUsageIsToldOnStandardError) {
     SCOPED_TRACE(testing::PrintToString(arguments));
     TCall call;
     call.arguments = arguments;
-    TRun const run = zep_.Run(call);
+    TRun const run = fZep.Run(call);
     EXPECT_EQ(run.status, 64);
     EXPECT_EQ(run.output, "");
     EXPECT_NE(run.errors, "");
@@ -715,7 +717,7 @@ TEST_F(ReportTest, WrongUsageIsToldOnStandardError) {
 }
 
 TEST_F(ReportTest, HelpAndVersionAreAnswered) {
-  TRun const version = zep_.Run({{"--version"}});
+  TRun const version = fZep.Run({{"--version"}});
   EXPECT_EQ(version.status, 0);
   EXPECT_EQ(version.output, "zep " TEST_VERSION " (build " TEST_BUILD_ID ")\n");
   struct TRow {
@@ -731,7 +733,7 @@ TEST_F(ReportTest, HelpAndVersionAreAnswered) {
     SCOPED_TRACE(testing::PrintToString(row.arguments));
     TCall call;
     call.arguments = row.arguments;
-    TRun const run = zep_.Run(call);
+    TRun const run = fZep.Run(call);
     EXPECT_EQ(run.status, 0);
     EXPECT_EQ(run.errors, "");
     for (char const* word : row.words) EXPECT_THAT(run.output, HasSubstr(word));

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep run, run as users run it.
 
 #include "tests/tools/zep/Zep.h"
@@ -14,10 +16,10 @@ class RunTest : public testing::Test {
 protected:
   TRun Run(std::vector<std::string> arguments) {
     arguments.insert(arguments.begin(), "run");
-    return zep_.Run({arguments});
+    return fZep.Run({arguments});
   }
 
-  TInstallation zep_;
+  TInstallation fZep;
 };
 
 TEST_F(RunTest, PrintsTheOutputOfTheCommand) {
@@ -78,7 +80,7 @@ TEST_F(RunTest, TellsThatACommandFailed) {
 TEST_F(RunTest, ACallerThatIgnoresItsChildrenMakesNoDifference) {
   TCall call = {{"run", "echo", "done"}};
   call.ignoresChildren = true;
-  TRun const run = zep_.Run(call);
+  TRun const run = fZep.Run(call);
   EXPECT_EQ(run.status, 0) << run.errors;
   EXPECT_EQ(run.output, "done\n");
 }
@@ -104,7 +106,7 @@ TEST_F(RunTest, ACallerThatBlocksSignalsDoesNotKeepItFromEnding) {
   TBlockedSignals const blocked;
   for (int const signal : {SIGTERM, SIGINT, SIGHUP}) {
     TCall call = {{"run", "--timeout", "20", "sh", "-c", "kill -" + std::to_string(signal) + " $PPID; exec sleep 1"}};
-    EXPECT_EQ(zep_.Run(call).status, 128 + signal);
+    EXPECT_EQ(fZep.Run(call).status, 128 + signal);
   }
 }
 

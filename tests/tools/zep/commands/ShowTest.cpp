@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep show, run as users run it.
 
 #include "tests/tools/zep/Zep.h"
@@ -16,16 +18,16 @@ using testing::HasSubstr;
 
 class ShowTest : public testing::Test {
 protected:
-  ShowTest() { zep_.Add("libTest.nsp.so", TEST_PROVIDER); }
+  ShowTest() { fZep.Add("libTest.nsp.so", TEST_PROVIDER); }
 
   TRun Run(std::vector<std::string> const& arguments, std::string const& behaviour = "odd") {
     TCall call;
     call.arguments = arguments;
     call.environment = {{"ZEP_SMBIOS_TABLE", SamplePath()}, {"ZEP_HOST_NAME", "db1"}, {"ZEP_TEST_PROVIDER", behaviour}};
-    return zep_.Run(call);
+    return fZep.Run(call);
   }
 
-  TInstallation zep_;
+  TInstallation fZep;
 };
 
 TEST_F(ShowTest, EveryPathThatOneRunPrintsAnotherOneShows) {
@@ -138,9 +140,9 @@ TEST_F(ShowTest, AClassIsShownWithInheritedPropertiesAndItsInstances) {
 TEST_F(ShowTest, AClassWithoutInstancesSaysWhy) {
   TCall call;
   call.arguments = {"show", "CIM_Chassis"};
-  call.environment = {{"ZEP_SMBIOS_TABLE", zep_.Path("nothing")}};
-  EXPECT_THAT(zep_.Run(call).output,
-              HasSubstr("\nInstances\nnone: the SMBIOS table file " + zep_.Path("nothing") + " does not exist\n"));
+  call.environment = {{"ZEP_SMBIOS_TABLE", fZep.Path("nothing")}};
+  EXPECT_THAT(fZep.Run(call).output,
+              HasSubstr("\nInstances\nnone: the SMBIOS table file " + fZep.Path("nothing") + " does not exist\n"));
 }
 
 TEST_F(ShowTest, AReferenceIsShownAsItsPath) {
@@ -161,7 +163,7 @@ TEST_F(ShowTest, WhatIsNotThereIsAnError) {
 }
 
 TEST_F(ShowTest, AnObjectWhoseKeysAreReferencesIsFoundByItsPrintedPath) {
-  zep_.Add("libClock.nsp.so", CLOCK_PLUGIN);
+  fZep.Add("libClock.nsp.so", CLOCK_PLUGIN);
   std::string const path = "X_RunsAtTheRateOf.Follower=\"X_Clock.Name=\"monotonic\"\",Leader=\"X_Clock.Name=\"realtime\"\"";
   auto const instances = JsonOf(Run({"report", "--json"}))["instances"];
   EXPECT_TRUE(std::any_of(instances.begin(), instances.end(),
@@ -181,8 +183,8 @@ TEST_F(ShowTest, AProviderThatFailedIsNamed) {
   std::string const nothing = "zep: no provider has the object \"X_Odd\"\n";
   EXPECT_EQ(Run({"show", "X_Odd"}, "throws").errors, "zep: Test: kZEPStatusAccessDenied\n" + nothing);
   EXPECT_EQ(Run({"show", "X_Odd"}, "fails-later").errors, "zep: Test: kZEPStatusFail\n" + nothing);
-  WriteFile(zep_.Path("lib/libBroken.nsp.so"), "this is no library");
-  EXPECT_EQ(Run({"show", "X_None"}).errors, "zep: Broken: " + zep_.Path("bin/../lib/libBroken.nsp.so") +
+  WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
+  EXPECT_EQ(Run({"show", "X_None"}).errors, "zep: Broken: " + fZep.Path("bin/../lib/libBroken.nsp.so") +
                                                 ": file too short\nzep: no provider has the object \"X_None\"\n");
   TRun const run = Run({"show", "X_Odd"});
   EXPECT_EQ(run.status, 0);

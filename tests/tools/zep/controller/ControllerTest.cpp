@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep remote without a controller: how it is called, where the password comes from, what it prints.
 
 #include "tests/tools/zep/Envelope.h"
@@ -64,12 +66,12 @@ protected:
     TCall call = {arguments};
     call.environment = environment;
     call.hasNoTerminal = true;
-    return zep_.Run(call);
+    return fZep.Run(call);
   }
 
   std::string File(std::string const& name, std::string const& text) {
-    WriteFile(zep_.Path(name), text);
-    return zep_.Path(name);
+    WriteFile(fZep.Path(name), text);
+    return fZep.Path(name);
   }
 
   static std::string Private(std::string const& file) {
@@ -77,8 +79,8 @@ protected:
     return file;
   }
 
-  TInstallation zep_;
-  std::map<std::string, std::string> const password_ = {{"ZEP_BMC_PASSWORD", "zeppass1"}};
+  TInstallation fZep;
+  std::map<std::string, std::string> const fPassword = {{"ZEP_BMC_PASSWORD", "zeppass1"}};
 };
 
 std::string const kNothing =
@@ -86,13 +88,13 @@ std::string const kNothing =
     "no memory left";
 
 TEST_F(ZepRemoteTest, WithoutTheClientLibraryNothingIsTold) {
-  TRun const run = Run({"192.0.2.1", "--user", "zepadmin"}, password_);
+  TRun const run = Run({"192.0.2.1", "--user", "zepadmin"}, fPassword);
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output,
             "Remote server    192.0.2.1\nMachine type     unknown\nModel            unknown\nSerial number    unknown\n");
   EXPECT_EQ(run.errors, "zep: 192.0.2.1: " + kNothing + "\n");
 
-  TRun const json = Run({"192.0.2.1", "--user", "zepadmin", "--json"}, password_);
+  TRun const json = Run({"192.0.2.1", "--user", "zepadmin", "--json"}, fPassword);
   EXPECT_EQ(json.status, 1);
   EXPECT_EQ(JsonOf(json)["document"], "zep remote");
   EXPECT_EQ(JsonOf(json)["host"], "192.0.2.1");
@@ -102,7 +104,7 @@ TEST_F(ZepRemoteTest, WithoutTheClientLibraryNothingIsTold) {
 
 TEST_F(ZepRemoteTest, AListPrintsOneLineForEachHost) {
   std::string const hosts = File("hosts", "# the machine room\n\none\n  two \t\r\n::1\n#\none");
-  TRun const run = Run({"--hosts", hosts, "--user", "zepadmin", "--parallel", "1"}, password_);
+  TRun const run = Run({"--hosts", hosts, "--user", "zepadmin", "--parallel", "1"}, fPassword);
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: 4 of 4 hosts done, 4 failed\n");
   std::vector<std::string> names;
@@ -125,7 +127,7 @@ TEST_F(ZepRemoteTest, WrongUsageIsToldApart) {
   };
   for (auto const& call : calls) {
     SCOPED_TRACE(testing::PrintToString(call));
-    TRun const run = Run(call, password_);
+    TRun const run = Run(call, fPassword);
     EXPECT_EQ(run.status, 64);
     EXPECT_EQ(run.output, "");
     EXPECT_NE(run.errors, "");
@@ -133,19 +135,19 @@ TEST_F(ZepRemoteTest, WrongUsageIsToldApart) {
 }
 
 TEST_F(ZepRemoteTest, AFileOfHostsThatCannotServeIsTold) {
-  std::string const absent = zep_.Path("absent"), empty = File("empty", "\n# nothing\n \n");
-  TRun const without = Run({"--hosts", absent, "--user", "u"}, password_);
+  std::string const absent = fZep.Path("absent"), empty = File("empty", "\n# nothing\n \n");
+  TRun const without = Run({"--hosts", absent, "--user", "u"}, fPassword);
   EXPECT_EQ(without.status, 1);
   EXPECT_EQ(without.errors, "zep: " + absent + " cannot be read: No such file or directory\n");
-  EXPECT_EQ(Run({"--hosts", empty, "--user", "u"}, password_).errors, "zep: " + empty + " names no host\n");
+  EXPECT_EQ(Run({"--hosts", empty, "--user", "u"}, fPassword).errors, "zep: " + empty + " names no host\n");
 }
 
 TEST_F(ZepRemoteTest, AFileOfHostsThatFailsWhileItIsReadIsNotTakenForItsEnd) {
   struct TRow {
     std::string path, reason;
   };
-  for (TRow const& row : {TRow{zep_.Path("lib"), "Is a directory"}, TRow{"/proc/self/mem", "Input/output error"}}) {
-    TRun const run = Run({"--hosts", row.path, "--user", "u"}, password_);
+  for (TRow const& row : {TRow{fZep.Path("lib"), "Is a directory"}, TRow{"/proc/self/mem", "Input/output error"}}) {
+    TRun const run = Run({"--hosts", row.path, "--user", "u"}, fPassword);
     EXPECT_EQ(run.status, 1);
     EXPECT_EQ(run.output, "");
     EXPECT_EQ(run.errors, "zep: " + row.path + " cannot be read: " + row.reason + "\n");
@@ -156,13 +158,13 @@ TEST_F(ZepRemoteTest, WithoutATerminalThePasswordMustComeFromElsewhere) {
   TRun const run = Run({"host", "--user", "u"});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: there is no terminal to ask for the password: set ZEP_BMC_PASSWORD or use --password-file\n");
-  std::string const absent = zep_.Path("absent");
-  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", absent}, password_).errors,
+  std::string const absent = fZep.Path("absent");
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", absent}, fPassword).errors,
             "zep: the file of --password-file cannot be read: No such file or directory\n");
-  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", zep_.Path("lib")}, password_).errors,
-            "zep: " + zep_.Path("lib") + " cannot be read: Is a directory\n");
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", fZep.Path("lib")}, fPassword).errors,
+            "zep: " + fZep.Path("lib") + " cannot be read: Is a directory\n");
   std::string const empty = File("empty", "");
-  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", empty}, password_).errors,
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", empty}, fPassword).errors,
             "zep: there is no password in " + empty + "\n");
   EXPECT_EQ(Run({"host", "--user", "u", "--password-file", Private(File("password", "zeppass1\n"))}).errors,
             "zep: host: " + kNothing + "\n");
@@ -171,8 +173,8 @@ TEST_F(ZepRemoteTest, WithoutATerminalThePasswordMustComeFromElsewhere) {
 }
 
 TEST_F(ZepRemoteTest, ADebugLogHoldsNoPassword) {
-  std::string const log = zep_.Path("log");
-  TRun const run = Run({"host", "--user", "u", "--debug-log", log}, password_);
+  std::string const log = fZep.Path("log");
+  TRun const run = Run({"host", "--user", "u", "--debug-log", log}, fPassword);
   EXPECT_EQ(run.errors, "zep: host: " + kNothing + "\n") << "so it is not warned of";
   EXPECT_THAT(ReadFile(log), HasSubstr("FDR_[Debug] "));
   EXPECT_EQ((run.errors + run.output + ReadFile(log)).find("zeppass1"), std::string::npos);
@@ -181,24 +183,24 @@ TEST_F(ZepRemoteTest, ADebugLogHoldsNoPassword) {
 TEST_F(ZepRemoteTest, ADebugLogIsForItsOwnerOnly) {
   std::string const log = File("log", "from before");
   fs::permissions(log, static_cast<fs::perms>(0644));
-  Run({"host", "--user", "u", "--debug-log", log}, password_);
+  Run({"host", "--user", "u", "--debug-log", log}, fPassword);
   EXPECT_EQ(fs::status(log).permissions(), static_cast<fs::perms>(0600));
   EXPECT_EQ(ReadFile(log).find("from before"), std::string::npos);
-  Run({"host", "--user", "u", "--debug-log", log + "2"}, password_);
+  Run({"host", "--user", "u", "--debug-log", log + "2"}, fPassword);
   EXPECT_EQ(fs::status(log + "2").permissions(), static_cast<fs::perms>(0600));
 }
 
 TEST_F(ZepRemoteTest, ADebugLogIsARegularFileOfTheCaller) {
-  std::string const victim = File("victim", "untouched"), link = zep_.Path("link"), fifo = zep_.Path("fifo");
+  std::string const victim = File("victim", "untouched"), link = fZep.Path("link"), fifo = fZep.Path("fifo");
   fs::create_symlink(victim, link);
-  fs::create_hard_link(victim, zep_.Path("second"));
+  fs::create_hard_link(victim, fZep.Path("second"));
   ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
   struct TRow {
     std::string log, reason;
   };
-  for (TRow const& row : {TRow{link, "it is a symbolic link"}, TRow{zep_.Path("second"), "it has a second name (a hard link)"},
+  for (TRow const& row : {TRow{link, "it is a symbolic link"}, TRow{fZep.Path("second"), "it has a second name (a hard link)"},
                           TRow{fifo, "it is not a regular file"}, TRow{"/dev/null", "it is not a regular file"}}) {
-    TRun const run = Run({"host", "--user", "u", "--debug-log", row.log}, password_);
+    TRun const run = Run({"host", "--user", "u", "--debug-log", row.log}, fPassword);
     EXPECT_EQ(run.status, 1);
     EXPECT_EQ(run.errors, "zep: the debug log " + row.log + " cannot be written: " + row.reason + "\n");
   }
@@ -209,7 +211,7 @@ TEST_F(ZepRemoteTest, AFileOfAnotherUserIsNoDebugLog) {
   NEEDS(::geteuid() == 0, "root, who may write another user's file");
   std::string const log = File("log", "untouched");
   ASSERT_EQ(::chown(log.c_str(), 65534, 65534), 0);
-  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", log}, password_).errors,
+  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", log}, fPassword).errors,
             "zep: the debug log " + log + " cannot be written: it belongs to another user\n");
   EXPECT_EQ(ReadFile(log), "untouched");
 }
@@ -225,10 +227,10 @@ TEST_F(ZepRemoteTest, APasswordFileThatEveryUserMayReadIsWarnedOf) {
 }
 
 TEST_F(ZepRemoteTest, AHostWithAPasswordIsNotAsked) {
-  TRun const run = Run({"admin:topsecret@host", "--user", "u", "--json"}, password_);
+  TRun const run = Run({"admin:topsecret@host", "--user", "u", "--json"}, fPassword);
   EXPECT_EQ(run.status, 64);
   EXPECT_THAT(run.errors, HasSubstr("zep: the host is not a host name or an address; "));
-  TRun const list = Run({"--hosts", File("hosts", "admin:topsecret@host\n"), "--user", "u"}, password_);
+  TRun const list = Run({"--hosts", File("hosts", "admin:topsecret@host\n"), "--user", "u"}, fPassword);
   EXPECT_EQ(list.status, 1);
   EXPECT_THAT(list.output, HasSubstr("line 1 of "));
   EXPECT_THAT(list.output, HasSubstr("not a host name or an address; "));
@@ -242,31 +244,31 @@ class ZepSecretProcessTest : public ZepRemoteTest {
 protected:
   void SetUp() override {
     NEEDS(::geteuid() == 0, "root, who looks at another user's process");
-    zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+    fZep.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
   }
   void TearDown() override {
-    if (zepProcess_ <= 0) return;
-    ::kill(zepProcess_, SIGKILL);
-    ::waitpid(zepProcess_, nullptr, 0);
+    if (fZepProcess <= 0) return;
+    ::kill(fZepProcess, SIGKILL);
+    ::waitpid(fZepProcess, nullptr, 0);
   }
 
   // zep as nobody, with a controller that does not answer; returns once the process that asks it is there.
   void Start() {
-    zepProcess_ = ::fork();
-    if (zepProcess_ == 0) {
+    fZepProcess = ::fork();
+    if (fZepProcess == 0) {
       ::prctl(PR_SET_PDEATHSIG, SIGKILL);
       ::setenv("ZEP_BMC_PASSWORD", "zeppass1", 1);
       ::setenv("FAKE_IPMI_CODE", "wait", 1);
-      std::string const program = zep_.Path("bin/zep");
+      std::string const program = fZep.Path("bin/zep");
       if (::setgroups(0, nullptr) != 0 || ::setgid(65534) != 0 || ::setuid(65534) != 0) ::_exit(126);
       ::execl(program.c_str(), "zep", "remote", "host", "--user", "u", nullptr);
       ::_exit(127);
     }
-    for (int tries = 0; tries < 2000 && child_.empty(); ++tries, ::usleep(5000)) {
-      std::ifstream children("/proc/" + std::to_string(zepProcess_) + "/task/" + std::to_string(zepProcess_) + "/children");
-      children >> child_;
+    for (int tries = 0; tries < 2000 && fChild.empty(); ++tries, ::usleep(5000)) {
+      std::ifstream children("/proc/" + std::to_string(fZepProcess) + "/task/" + std::to_string(fZepProcess) + "/children");
+      children >> fChild;
     }
-    ASSERT_FALSE(child_.empty());
+    ASSERT_FALSE(fChild.empty());
   }
 
   static unsigned OwnerOf(std::string const& process) {
@@ -286,13 +288,13 @@ protected:
     return WEXITSTATUS(status);
   }
 
-  pid_t zepProcess_ = 0;
-  std::string child_;  // the process that asks the controller
+  pid_t fZepProcess = 0;
+  std::string fChild;  // the process that asks the controller
 };
 
 TEST_F(ZepSecretProcessTest, TheEnvironmentShowsNoPassword) {
   Start();
-  for (std::string const& process : {std::to_string(zepProcess_), child_}) {
+  for (std::string const& process : {std::to_string(fZepProcess), fChild}) {
     std::string const environment = ReadFile("/proc/" + process + "/environ");
     EXPECT_THAT(environment, HasSubstr("FAKE_IPMI_CODE=wait"));
     EXPECT_EQ(environment.find("zeppass1"), std::string::npos);
@@ -301,24 +303,24 @@ TEST_F(ZepSecretProcessTest, TheEnvironmentShowsNoPassword) {
 
 TEST_F(ZepSecretProcessTest, NoProcessOfTheSameUserLooksIntoIt) {
   Start();
-  for (std::string const& process : {std::to_string(zepProcess_), child_}) {
+  for (std::string const& process : {std::to_string(fZepProcess), fChild}) {
     EXPECT_EQ(OwnerOf(process), 0u) << "so it is dumped nowhere";
     EXPECT_EQ(TraceOf(process), EPERM);
   }
 }
 
 TEST_F(ZepRemoteTest, ADebugLogThatCannotBeWrittenIsTold) {
-  std::string const nowhere = zep_.Path("none/log");
-  TRun const run = Run({"host", "--user", "u", "--debug-log", nowhere}, password_);
+  std::string const nowhere = fZep.Path("none/log");
+  TRun const run = Run({"host", "--user", "u", "--debug-log", nowhere}, fPassword);
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, "");
   EXPECT_EQ(run.errors, "zep: the debug log " + nowhere + " cannot be written: No such file or directory\n");
-  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", zep_.Path("lib")}, password_).errors,
-            "zep: the debug log " + zep_.Path("lib") + " cannot be written: Is a directory\n");
+  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", fZep.Path("lib")}, fPassword).errors,
+            "zep: the debug log " + fZep.Path("lib") + " cannot be written: Is a directory\n");
 }
 
 TEST_F(ZepRemoteTest, WhyThereIsNoSessionIsToldInWords) {
-  zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+  fZep.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
   struct TRow {
     char const *code, *words;
   } const rows[] = {
@@ -337,10 +339,10 @@ TEST_F(ZepRemoteTest, WhyThereIsNoSessionIsToldInWords) {
       {"-7", "code -7 of libipmiClient.so"},
       {"4711", "code 4711 of libipmiClient.so"},
   };
-  std::string const log = zep_.Path("log");
+  std::string const log = fZep.Path("log");
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.code);
-    auto environment = password_;
+    auto environment = fPassword;
     environment["FAKE_IPMI_CODE"] = row.code;
     TRun const run = Run({"host", "--user", "u"}, environment);
     EXPECT_EQ(run.status, 1);
@@ -353,21 +355,21 @@ TEST_F(ZepRemoteTest, WhyThereIsNoSessionIsToldInWords) {
 
 // The code is read from a log that has what the caller gave before it.
 TEST_F(ZepRemoteTest, NoUserOrPasswordPassesForACode) {
-  zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+  fZep.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
   std::string const forged = "x\nFDR_[Debug] 1/1/2026  0:0:0 Connection Error code:3\n";
   TRun const run = Run({"host", "--user", forged}, {{"ZEP_BMC_PASSWORD", forged}, {"FAKE_IPMI_CODE", "1"}});
   EXPECT_THAT(run.errors, testing::EndsWith(": it refuses the password\n"));
 }
 
 TEST_F(ZepRemoteTest, AClientLibraryWithoutItsFunctionIsTold) {
-  zep_.Add("libipmiClient.so", TEST_LIB_DIR "/libsmbios.so");
-  EXPECT_EQ(Run({"host", "--user", "u"}, password_).errors,
+  fZep.Add("libipmiClient.so", TEST_LIB_DIR "/libsmbios.so");
+  EXPECT_EQ(Run({"host", "--user", "u"}, fPassword).errors,
             "zep: host: no session with its controller after N s: libipmiClient.so lacks a function\n");
 }
 
 TEST_F(ZepRemoteTest, AnOpenedSessionThatTellsNothingIsTold) {
-  zep_.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
-  auto environment = password_;
+  fZep.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
+  auto environment = fPassword;
   environment["FAKE_IPMI_CODE"] = "0";
   TRun const run = Run({"host", "--user", "u", "--json"}, environment);
   EXPECT_EQ(run.status, 1);
@@ -408,7 +410,7 @@ TSession TypeAt(TInstallation const& zep, std::string const& typed) {
 }
 
 TEST_F(ZepRemoteTest, ThePasswordIsAskedForWithoutEcho) {
-  TSession const session = TypeAt(zep_, "zeppass1\n");
+  TSession const session = TypeAt(fZep, "zeppass1\n");
   EXPECT_EQ(session.status, 1);
   EXPECT_THAT(session.shown, testing::StartsWith("Password of zepadmin: \r\nRemote server"));
   EXPECT_THAT(session.shown, HasSubstr("zep: host: " + kNothing));
@@ -416,13 +418,13 @@ TEST_F(ZepRemoteTest, ThePasswordIsAskedForWithoutEcho) {
 }
 
 TEST_F(ZepRemoteTest, AnInterruptInsteadOfThePasswordEndsIt) {
-  TSession const session = TypeAt(zep_, "zepp\x03");
+  TSession const session = TypeAt(fZep, "zepp\x03");
   EXPECT_EQ(session.status, 128 + SIGINT);
   EXPECT_EQ(session.shown, "Password of zepadmin: \r\n");
 }
 
 TEST_F(ZepRemoteTest, WithoutAPasswordNothingIsAsked) {
-  TSession const session = TypeAt(zep_, "\x04");
+  TSession const session = TypeAt(fZep, "\x04");
   EXPECT_EQ(session.status, 1);
   EXPECT_EQ(session.shown, "Password of zepadmin: \r\nzep: no password was given\r\n");
 }

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // zep media: names, what lsblk, blkid and the kernel write, and the command run with programs that stand in for them. Real
 // media are mounted in tests/system/media.
 
@@ -197,19 +199,19 @@ TEST(MediaTest, AllMountsAreListedInOrder) {
 
 class MediaCommandTest : public testing::Test {
 protected:
-  void SetUp() override { fs::create_directory(installation_.Path("stand-ins")); }
+  void SetUp() override { fs::create_directory(fInstallation.Path("stand-ins")); }
 
   void AddStandIn(std::string const& name, std::string const& body) {
-    std::string const path = installation_.Path("stand-ins/" + name);
+    std::string const path = fInstallation.Path("stand-ins/" + name);
     WriteFile(path, "#!/bin/sh\n" + body + "\n");
     fs::permissions(path, fs::perms::all);
   }
   TRun Run(std::vector<std::string> arguments, bool asNobody = false) {
     arguments.insert(arguments.begin(), "media");
-    return installation_.Run({arguments, {{"PATH", installation_.Path("stand-ins") + ":/usr/bin:/bin"}}, asNobody});
+    return fInstallation.Run({arguments, {{"PATH", fInstallation.Path("stand-ins") + ":/usr/bin:/bin"}}, asNobody});
   }
 
-  TInstallation installation_;
+  TInstallation fInstallation;
 };
 
 TEST_F(MediaCommandTest, ListsMediaAsATable) {
@@ -307,7 +309,7 @@ TEST_F(MediaCommandTest, SaysWhenLabelsCannotBeRead) {
 }
 
 TEST_F(MediaCommandTest, RefusesNamesBeforeAnythingIsRun) {
-  for (char const* program : {"mount", "umount"}) AddStandIn(program, "echo run >> " + installation_.Path("run"));
+  for (char const* program : {"mount", "umount"}) AddStandIn(program, "echo run >> " + fInstallation.Path("run"));
   struct TRow {
     std::vector<std::string> arguments;
     int status;
@@ -337,17 +339,17 @@ TEST_F(MediaCommandTest, RefusesNamesBeforeAnythingIsRun) {
     EXPECT_THAT(run.errors, StartsWith(row.errors));
     EXPECT_EQ(run.output, "");
   }
-  EXPECT_FALSE(fs::exists(installation_.Path("run")));
+  EXPECT_FALSE(fs::exists(fInstallation.Path("run")));
 }
 
 TEST_F(MediaCommandTest, AReportGoesToNoOtherNameThanThatOfADevice) {
   for (char const* name : {"/tmp", "/dev/sdb;x", "key"}) {
-    TRun const run = installation_.Run({{"report", "--sample", "--to-media", name}});
+    TRun const run = fInstallation.Run({{"report", "--sample", "--to-media", name}});
     EXPECT_EQ(run.status, 64) << name;
     EXPECT_THAT(run.errors, HasSubstr("is not a name of a device"));
     EXPECT_EQ(run.output, "");
   }
-  TRun const run = installation_.Run({{"report", "--sample", "--to-media", "/dev/no-such-device"}});
+  TRun const run = fInstallation.Run({{"report", "--sample", "--to-media", "/dev/no-such-device"}});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: there is no device /dev/no-such-device\n");
 }

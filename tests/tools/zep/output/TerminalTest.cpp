@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // What zep prints at a terminal: as wide as that is, and in plain lines at a dumb one.
 
 #include "tools/zep/output/Terminal.h"
@@ -47,14 +49,14 @@ protected:
     return longest;
   }
 
-  TInstallation zep_;
+  TInstallation fZep;
 
 private:
   [[noreturn]] void Exec(std::vector<std::string> const& words, std::map<std::string, std::string> const& environment) {
     ::unsetenv("COLUMNS");
     ::setenv("TERM", "xterm", 1);
     for (auto const& [name, value] : environment) ::setenv(name.c_str(), value.c_str(), 1);
-    std::string const program = zep_.Path("bin/zep");
+    std::string const program = fZep.Path("bin/zep");
     std::vector<char*> arguments = {const_cast<char*>("zep")};
     for (std::string const& word : words) arguments.push_back(const_cast<char*>(word.c_str()));
     arguments.push_back(nullptr);
@@ -67,8 +69,8 @@ private:
 std::string const kWords = "twelve words that are as long as they need be to fill a whole line and more";
 
 TEST_F(AtTerminalTest, ATableIsAsWideAsTheTerminal) {
-  WriteFile(zep_.Path("a.mof"), "class X_A { string PropertyWithAName = \"" + kWords + "\"; };\n");
-  std::vector<std::string> const call = {"show", "X_A", "--mof", zep_.Path("a.mof")};
+  WriteFile(fZep.Path("a.mof"), "class X_A { string PropertyWithAName = \"" + kWords + "\"; };\n");
+  std::vector<std::string> const call = {"show", "X_A", "--mof", fZep.Path("a.mof")};
   EXPECT_LE(LongestLineOf(Shown(call, 80)), 80u);
   EXPECT_THAT(Shown(call, 80), Not(HasSubstr(kWords)));
   EXPECT_THAT(Shown(call, 160), HasSubstr(kWords)) << "there is room for it";
@@ -77,8 +79,8 @@ TEST_F(AtTerminalTest, ATableIsAsWideAsTheTerminal) {
 }
 
 TEST_F(AtTerminalTest, ColumnsCountsBeforeTheSystem) {
-  WriteFile(zep_.Path("a.mof"), "class X_A { string PropertyWithAName = \"" + kWords + "\"; };\n");
-  std::vector<std::string> const call = {"show", "X_A", "--mof", zep_.Path("a.mof")};
+  WriteFile(fZep.Path("a.mof"), "class X_A { string PropertyWithAName = \"" + kWords + "\"; };\n");
+  std::vector<std::string> const call = {"show", "X_A", "--mof", fZep.Path("a.mof")};
   EXPECT_THAT(Shown(call, 80, {{"COLUMNS", "160"}}), HasSubstr(kWords));
   EXPECT_LE(LongestLineOf(Shown(call, 160, {{"COLUMNS", "60"}})), 60u);
   EXPECT_LE(LongestLineOf(Shown(call, 80, {{"COLUMNS", "wide"}})), 80u);
@@ -89,22 +91,22 @@ TEST_F(AtTerminalTest, NoWordIsCut) {
     std::string const shown = Shown({"show", "CIM_PhysicalMemory", "--sample"}, columns);
     EXPECT_THAT(shown, HasSubstr("\nConfiguredMemoryClockSpeed ")) << columns;
   }
-  EXPECT_THAT(zep_.Run({{"show", "CIM_PhysicalMemory", "--sample"}}).output, HasSubstr("\nConfiguredMemoryClockSpeed "));
+  EXPECT_THAT(fZep.Run({{"show", "CIM_PhysicalMemory", "--sample"}}).output, HasSubstr("\nConfiguredMemoryClockSpeed "));
 }
 
 TEST_F(AtTerminalTest, ADumbTerminalGetsPlainLines) {
-  WriteFile(zep_.Path("a.mof"), "class X_A { string PropertyWithAName = \"" + kWords + "\"; };\n");
-  std::string const shown = Shown({"show", "X_A", "--mof", zep_.Path("a.mof")}, 60, {{"TERM", "dumb"}});
+  WriteFile(fZep.Path("a.mof"), "class X_A { string PropertyWithAName = \"" + kWords + "\"; };\n");
+  std::string const shown = Shown({"show", "X_A", "--mof", fZep.Path("a.mof")}, 60, {{"TERM", "dumb"}});
   EXPECT_THAT(shown, HasSubstr(kWords)) << "a row is one line";
   EXPECT_EQ(shown.find('\x1b'), std::string::npos);
   EXPECT_EQ(shown.find('\r'), std::string::npos);
 }
 
 TEST_F(AtTerminalTest, AListOfHostsShowsItsProgressInPlainLines) {
-  WriteFile(zep_.Path("hosts"), "one\ntwo\n");
-  WriteFile(zep_.Path("password"), "p\n");
-  std::vector<std::string> const call = {"remote", "--hosts",         zep_.Path("hosts"),   "--user",
-                                         "u",      "--password-file", zep_.Path("password")};
+  WriteFile(fZep.Path("hosts"), "one\ntwo\n");
+  WriteFile(fZep.Path("password"), "p\n");
+  std::vector<std::string> const call = {"remote", "--hosts",         fZep.Path("hosts"),   "--user",
+                                         "u",      "--password-file", fZep.Path("password")};
   EXPECT_THAT(Shown(call, 80), HasSubstr("\rzep: 2 of 2 hosts done, 2 failed\n"));
   std::string const dumb = Shown(call, 80, {{"TERM", "dumb"}});
   EXPECT_THAT(dumb, HasSubstr("\nzep: 2 of 2 hosts done, 2 failed\n"));
@@ -112,10 +114,10 @@ TEST_F(AtTerminalTest, AListOfHostsShowsItsProgressInPlainLines) {
 }
 
 TEST_F(AtTerminalTest, HelpIsACommandToo) {
-  EXPECT_EQ(zep_.Run({{"help"}}).output, zep_.Run({{"--help"}}).output);
-  EXPECT_EQ(zep_.Run({{"help", "report"}}).output, zep_.Run({{"report", "--help"}}).output);
-  EXPECT_EQ(zep_.Run({{"help", "media", "mount"}}).output, zep_.Run({{"media", "mount", "--help"}}).output);
-  TRun const wrong = zep_.Run({{"help", "bogus"}});
+  EXPECT_EQ(fZep.Run({{"help"}}).output, fZep.Run({{"--help"}}).output);
+  EXPECT_EQ(fZep.Run({{"help", "report"}}).output, fZep.Run({{"report", "--help"}}).output);
+  EXPECT_EQ(fZep.Run({{"help", "media", "mount"}}).output, fZep.Run({{"media", "mount", "--help"}}).output);
+  TRun const wrong = fZep.Run({{"help", "bogus"}});
   EXPECT_EQ(wrong.status, 64);
   EXPECT_EQ(wrong.errors, "zep: there is no such command; zep --help lists them\n");
 }

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // To be preloaded: a file that cannot be read from some byte on, as on a failing disk. ZEP_TEST_FAILING_FILE names it and
 // ZEP_TEST_FAILING_BYTE the byte, counted from 0.
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Stands in for libipmiClient.so: opening fails with the code that the environment variable FAKE_IPMI_CODE names; after half
 // a minute for "wait".
 

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // A provider plug-in with the behaviours that the environment variable ZEP_TEST_PROVIDER names, one word after the other.
 
 #include "ICIMClass.h"

@@ -1,3 +1,5 @@
+// SPDX-License-Identifier: Apache-2.0
+
 // Work in processes of its own.
 
 #include "tools/zep/processes/Processes.h"
