@@ -39,7 +39,8 @@ TRoom const kRooms[] = {
     {"providers/memory", {"include"}},
     {"providers/mof", {"include", "providers/memory"}},
     {"providers/host", {"include", "providers/memory", "platform/include"}},
-    {"tools/zep", {"include", "providers/memory", "providers/mof"}},
+    {"collect", {"include", "providers/memory", "providers/mof", "tools/zep"}},
+    {"tools/zep", {"include", "providers/memory", "providers/mof", "collect"}},
 };
 
 fs::path const kSource = ZEP_SOURCE_DIR;

@@ -2,11 +2,11 @@
 
 // zep classes: the classes of the providers' namespaces, or of a schema.
 
-#include "tools/zep/ClassTree.h"
-#include "tools/zep/PlugIns.h"
-#include "tools/zep/Sample.h"
+#include "collect/ClassTree.h"
+#include "collect/MofFile.h"
+#include "collect/PlugIns.h"
+#include "collect/Sample.h"
 #include "tools/zep/commands/Commands.h"
-#include "tools/zep/commands/MofFile.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"

@@ -2,8 +2,8 @@
 
 // zep report: which machine this is.
 
-#include "tools/zep/Report.h"
-#include "tools/zep/Sample.h"
+#include "collect/Report.h"
+#include "collect/Sample.h"
 #include "tools/zep/commands/Commands.h"
 #include "tools/zep/media/TMountedMedium.h"
 #include "tools/zep/output/Json.h"

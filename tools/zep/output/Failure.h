@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "collect/FailureOf.h"
 #include "tools/zep/output/ExitStatus.h"
 
 #include <exception>
@@ -25,19 +26,6 @@ struct TWrongUsage : TFailure {
 inline EExitStatus StatusOf(std::exception const& thrown) {
   auto const* const failure = dynamic_cast<TFailure const*>(&thrown);
   return failure != nullptr ? failure->fStatus : kExitNothing;
-}
-
-// Runs what a plug-in has a part in, and returns why it failed, or an empty text. A plug-in may throw anything.
-template <class TWork>
-std::string FailureOf(TWork work) {
-  try {
-    work();
-    return "";
-  } catch (std::exception const& failure) {
-    return failure.what();
-  } catch (...) {
-    return "it threw something that is no exception of the standard library";
-  }
 }
 
 }  // namespace NQRVZEP20::zep

@@ -5,8 +5,8 @@
 #include "ICIMInstance.h"
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
-#include "tools/zep/Sample.h"
-#include "tools/zep/ValueWords.h"
+#include "collect/Sample.h"
+#include "collect/ValueWords.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/secrets/Secrets.h"
 

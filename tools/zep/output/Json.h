@@ -2,7 +2,7 @@
 #pragma once
 
 #include "TCIMValue.h"
-#include "tools/zep/TNamespaceView.h"
+#include "collect/TNamespaceView.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Output.h"

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "tools/zep/Report.h"
+#include "collect/Report.h"
 
 #include "ICIMInstance.h"
-#include "tools/zep/Sample.h"
+#include "collect/Sample.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"
 

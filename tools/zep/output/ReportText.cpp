@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "tools/zep/Report.h"
-#include "tools/zep/Sample.h"
+#include "collect/Report.h"
+#include "collect/Sample.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/secrets/Secrets.h"
 

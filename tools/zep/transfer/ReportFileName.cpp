@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "tools/zep/Report.h"
+#include "collect/Report.h"
 
 #include <algorithm>
 #include <cctype>

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "tools/zep/Report.h"
+#include "collect/Report.h"
 #include "tools/zep/transfer/Transfer.h"
 
 namespace NQRVZEP20::zep {

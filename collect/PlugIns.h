@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "TNamespaceView.h"
+#include "collect/TNamespaceView.h"
 
 #include <memory>
 #include <string>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "tools/zep/commands/MofFile.h"
+#include "collect/MofFile.h"
 
 #include "providers/memory/TMemoryNamespace.h"
 #include "providers/mof/Mof.h"

@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "Report.h"
+#include "collect/Report.h"
 
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
 #include "ICIMProperty.h"
-#include "Sample.h"
 #include "TCIMSchemaHelper.h"
 #include "TZEPException.h"
+#include "collect/Sample.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Text.h"
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "tools/zep/ValueWords.h"
+#include "collect/ValueWords.h"
 
 #include "ICIMClass.h"
 #include "ICIMPropertyDecl.h"

@@ -1,14 +1,14 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "TNamespaceView.h"
+#include "collect/TNamespaceView.h"
 
 #include "ICIMClass.h"
 #include "ICIMInstance.h"
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
 #include "ICIMQualifier.h"
-#include "Sample.h"
 #include "TAddToVectorCallback.h"
 #include "TZEPException.h"
+#include "collect/Sample.h"
 #include "tools/zep/output/Text.h"
 
 #include <algorithm>

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "PlugIns.h"
-#include "TNamespaceView.h"
+#include "collect/PlugIns.h"
+#include "collect/TNamespaceView.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Json.h"
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "Sample.h"
+#include "collect/Sample.h"
 
 #include <cstdlib>
 #include <filesystem>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "ClassTree.h"
+#include "collect/ClassTree.h"
 
 #include "ICIMClass.h"
 #include "ICIMQualifier.h"

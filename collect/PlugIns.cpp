@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "PlugIns.h"
+#include "collect/PlugIns.h"
 
 #include "ILogger.h"
 #include "INamespaceProvider.h"
