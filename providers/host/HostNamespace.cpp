@@ -4,9 +4,9 @@
 #include "HostRecords.h"
 #include "ScsiRecords.h"
 #include "SmbiosRecords.h"
-#include "TNamespaceWriter.h"
 #include "TSmbiosReader.h"
 #include "providers/memory/TMemoryNamespace.h"
+#include "providers/reasons/TRecordWriter.h"
 
 #include <sys/utsname.h>
 
@@ -22,8 +22,8 @@ utsname Kernel() {
 
 // Writes a class with a record of each structure of that type that `isThere`. `makeRecord` is given a structure and its number.
 template <class TMakeRecord, class TIsThere>
-void WriteEach(TNamespaceWriter& writer, TSmbiosReader const& tables, int type, TIsThere isThere,
-               std::string const& whyNoneIsThere, TMakeRecord makeRecord) {
+void WriteEach(TRecordWriter& writer, TSmbiosReader const& tables, int type, TIsThere isThere, std::string const& whyNoneIsThere,
+               TMakeRecord makeRecord) {
   std::vector<TSmbiosStructure> const structures = tables.All(type);
   std::vector<TRecord> records;
   for (TSmbiosStructure const& structure : structures)
@@ -38,7 +38,7 @@ bool Always(TSmbiosStructure const&) { return true; }
 }  // namespace
 
 void FillHostNamespace(TMemoryNamespace& ns) {
-  TNamespaceWriter writer(ns);
+  TRecordWriter writer(ns);
 
   utsname const kernel = Kernel();
   TSystemName const name = SystemNameOf(kernel);

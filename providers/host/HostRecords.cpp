@@ -27,7 +27,7 @@ TSystemName SystemNameOf(utsname const& kernel) {
 TRecord OperatingSystemRecord(TOsRelease const& release, utsname const& kernel, TSystemName const& name) {
   TRecord record(TCIMSchemaHelper::kOperatingSystemCreationClassName, release.GetFile());
   record.AddKey("CSCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
-  record.AddKey("CSName", name);
+  record.AddPropagatedKey("CSName", name.fName);
   record.AddKey("CreationClassName", TCIMSchemaHelper::kOperatingSystemCreationClassName);
   record.AddKey("Name", release.Value({"NAME"}));
   record.Add("Caption", release.Value({"PRETTY_NAME"}));

@@ -2,7 +2,8 @@
 #pragma once
 
 #include "OsRelease.h"
-#include "TRecord.h"
+#include "TSystemName.h"
+#include "providers/reasons/TRecord.h"
 
 #include <string>
 

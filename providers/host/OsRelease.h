@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "Finding.h"
+#include "providers/reasons/TFinding.h"
 
 #include <map>
 #include <string>

@@ -121,12 +121,11 @@ TFinding<std::string> HostNameOf(std::string const& nodeName) {
   return nodeName;
 }
 
-TFinding<std::string> WithoutPlaceholder(TFinding<std::string> const& text) {
-  if (!text) return text;
-  if (WithoutOuterBlanks(*text).empty()) return TMissing{kMissingNotGiven, "the firmware gives a blank text"};
-  if (HasOnly(WithoutOuterBlanks(*text), '\xff'))  // memory that was never written
+TFinding<std::string> WithoutPlaceholder(std::string const& text) {
+  if (WithoutOuterBlanks(text).empty()) return TMissing{kMissingNotGiven, "the firmware gives a blank text"};
+  if (HasOnly(WithoutOuterBlanks(text), '\xff'))  // memory that was never written
     return TMissing{kMissingNotGiven, "not programmed in the firmware's table (0xFF)"};
-  if (IsPlaceholder(*text)) return TMissing{kMissingPlaceholder, "placeholder text of the firmware: \"" + *text + "\""};
+  if (IsPlaceholder(text)) return TMissing{kMissingPlaceholder, "placeholder text of the firmware: \"" + text + "\""};
   return text;
 }
 

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "Finding.h"
+#include "providers/reasons/TFinding.h"
 
 #include <string>
 #include <string_view>
@@ -16,7 +16,7 @@ bool IsPlaceholder(std::string_view text);
 // firmware's placeholders are not looked for: a machine may well be called "default".
 TFinding<std::string> HostNameOf(std::string const& nodeName);
 
-// The same finding, but missing where its text is a placeholder or blank.
-TFinding<std::string> WithoutPlaceholder(TFinding<std::string> const& text);
+// The text; missing when it is blank, a placeholder, or only bytes 0xFF, which flash memory contains until it is programmed.
+TFinding<std::string> WithoutPlaceholder(std::string const& text);
 
 }  // namespace NQRVZEP20

@@ -76,11 +76,10 @@ TText ReadLine(std::string const& file) {
   return line.substr(first, line.find_last_not_of(' ') - first + 1);
 }
 
-TText DeviceTypeFrom(TText const& number) {
-  if (!number) return number;
+TText DeviceTypeFrom(std::string const& number) {
   char* end = nullptr;
-  unsigned long const type = std::strtoul(number->c_str(), &end, 10);
-  if (*end != '\0' || type > 0x1f) return TMissing{kMissingUnexpected, "\"" + *number + "\" is no type of SCSI devices"};
+  unsigned long const type = std::strtoul(number.c_str(), &end, 10);
+  if (*end != '\0' || type > 0x1f) return TMissing{kMissingUnexpected, "\"" + number + "\" is not a SCSI device type"};
   return type < std::size(kDeviceTypes) ? std::string(kDeviceTypes[type]) : "Unknown Device, type " + std::to_string(type);
 }
 
@@ -88,7 +87,7 @@ TRecord MakeRecord(TSystemName const& name, TText const& id, TText const& type, 
                    TText const& revision) {
   TRecord record(kClassName, "sysfs");
   record.AddKey("SystemCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
-  record.AddKey("SystemName", name);
+  record.AddPropagatedKey("SystemName", name.fName);
   record.AddKey("CreationClassName", kClassName);
   record.AddKey("DeviceID", id);
   record.Add("DeviceType", type);
@@ -111,7 +110,7 @@ std::vector<TRecord> ScsiRecords(std::string const& directory, TSystemName const
     std::string const device = directory + "/" + address.fText + "/";
     TText const type = ReadLine(device + "type");
     if (!type) continue;
-    records.push_back(MakeRecord(name, address.fText, DeviceTypeFrom(type), ReadLine(device + "vendor"),
+    records.push_back(MakeRecord(name, address.fText, type.Then(DeviceTypeFrom), ReadLine(device + "vendor"),
                                  ReadLine(device + "model"), ReadLine(device + "rev")));
   }
   return records;

@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "TRecord.h"
+#include "TSystemName.h"
+#include "providers/reasons/TRecord.h"
 
 #include <string>
 #include <vector>

@@ -16,15 +16,16 @@ namespace {
 TMissing Unknown() { return {kMissingNotGiven, "the firmware calls it unknown"}; }
 
 TFinding<std::string> TextOf(TSmbiosStructure const& structure, std::size_t offset) {
-  return WithoutPlaceholder(structure.Text(offset));
+  return structure.Text(offset).Then(WithoutPlaceholder);
 }
 
 // The number as a T, unless it is the one that stands for "unknown".
 template <class T, class TNumber>
 TFinding<T> NumberOf(TFinding<TNumber> const& number, TNumber unknown) {
-  if (!number) return number.Why();
-  if (*number == unknown) return Unknown();
-  return static_cast<T>(*number);
+  return number.Then([unknown](TNumber known) -> TFinding<T> {
+    if (known == unknown) return Unknown();
+    return static_cast<T>(known);
+  });
 }
 
 bool IsNumber(TFinding<std::uint8_t> const& found, std::uint8_t number) { return found && *found == number; }
@@ -36,22 +37,27 @@ bool AreAll(std::vector<unsigned char> const& bytes, unsigned char value) {
   return std::all_of(bytes.begin(), bytes.end(), [value](unsigned char byte) { return byte == value; });
 }
 
-// Since version 2.6 of the standard the first three fields are little-endian; before, they stand as they are printed.
-TFinding<std::string> UuidOf(TSmbiosStructure const& system, std::optional<TSmbiosVersion> version) {
-  auto const uuid = system.Bytes(0x08, 16);
-  if (!uuid) return uuid.Why();
-  auto u = *uuid;
+// Bytes in the order in which a UUID is printed.
+TFinding<std::string> UuidFrom(std::vector<unsigned char> const& u) {
   if (AreAll(u, 0x00)) return TMissing{kMissingNotGiven, "the firmware gives none (all zeros)"};
-  if (AreAll(u, 0xff)) return TMissing{kMissingNotGiven, "the firmware leaves it to be set (all ones)"};
-  if (!version || *version >= TSmbiosVersion(2, 6)) {
-    std::reverse(u.begin(), u.begin() + 4);
-    std::reverse(u.begin() + 4, u.begin() + 6);
-    std::reverse(u.begin() + 6, u.begin() + 8);
-  }
+  if (AreAll(u, 0xff)) return TMissing{kMissingNotGiven, "not set by the firmware (all ones)"};
   char text[37];
   std::snprintf(text, sizeof text, "%02X%02X%02X%02X-%02X%02X-%02X%02X-%02X%02X-%02X%02X%02X%02X%02X%02X", u[0], u[1], u[2], u[3],
                 u[4], u[5], u[6], u[7], u[8], u[9], u[10], u[11], u[12], u[13], u[14], u[15]);
-  return WithoutPlaceholder(std::string(text));
+  return WithoutPlaceholder(text);
+}
+
+// The first three fields are little-endian since version 2.6 of the standard; before, they have the printed order.
+TFinding<std::string> UuidOf(TSmbiosStructure const& system, std::optional<TSmbiosVersion> version) {
+  bool const isLittleEndian = !version || *version >= TSmbiosVersion(2, 6);
+  return system.Bytes(0x08, 16).Then([isLittleEndian](std::vector<unsigned char> bytes) {
+    if (isLittleEndian) {
+      std::reverse(bytes.begin(), bytes.begin() + 4);
+      std::reverse(bytes.begin() + 4, bytes.begin() + 6);
+      std::reverse(bytes.begin() + 6, bytes.begin() + 8);
+    }
+    return UuidFrom(bytes);
+  });
 }
 
 // ---- BIOS ----
@@ -64,17 +70,16 @@ bool IsDayOfMonth(unsigned day, unsigned month, unsigned year) {
 }
 
 // "mm/dd/yyyy"; "mm/dd/yy" is of the 20th century.
-TFinding<TCIMDateTime> DateOf(TFinding<std::string> const& text) {
-  if (!text) return text.Why();
-  TMissing const notADate{kMissingUnexpected, "not in the expected form: \"" + *text + "\" is no date"};
-  std::string shape = *text;
+TFinding<TCIMDateTime> DateFrom(std::string const& text) {
+  TMissing const notADate{kMissingUnexpected, "not in the expected form: \"" + text + "\" is not a date"};
+  std::string shape = text;
   for (char& c : shape)
     if (c >= '0' && c <= '9') c = '9';
   if (shape != "99/99/9999" && shape != "99/99/99") return notADate;
 
-  unsigned const month = std::stoul(text->substr(0, 2));
-  unsigned const day = std::stoul(text->substr(3, 2));
-  unsigned const year = std::stoul(text->substr(6)) + (shape.size() == 8 ? 1900 : 0);
+  unsigned const month = std::stoul(text.substr(0, 2));
+  unsigned const day = std::stoul(text.substr(3, 2));
+  unsigned const year = std::stoul(text.substr(6)) + (shape.size() == 8 ? 1900 : 0);
   if (!IsDayOfMonth(day, month, year)) return notADate;
   try {
     return TCIMDateTime(static_cast<unsigned short>(year), static_cast<unsigned short>(month), day, 0, 0, 0, 0, 0);
@@ -85,16 +90,12 @@ TFinding<TCIMDateTime> DateOf(TFinding<std::string> const& text) {
 
 // The segment at which a BIOS of the old kind begins; UEFI firmware gives 0.
 TFinding<std::uint64_t> StartAddressOf(TSmbiosStructure const& bios) {
-  auto const segment = NumberOf<std::uint64_t>(bios.Word(0x06), std::uint16_t(0));
-  if (!segment) return segment.Why();
-  return *segment << 4;
+  return NumberOf<std::uint64_t>(bios.Word(0x06), std::uint16_t(0)).Then([](std::uint64_t segment) { return segment << 4; });
 }
 
 // Such a BIOS ends where the first megabyte ends.
 TFinding<std::uint64_t> EndAddressOf(TSmbiosStructure const& bios) {
-  auto const start = StartAddressOf(bios);
-  if (!start) return start.Why();
-  return std::uint64_t(0xfffff);
+  return StartAddressOf(bios).Then([](std::uint64_t) { return std::uint64_t(0xfffff); });
 }
 
 // ---- Chassis ----
@@ -141,52 +142,42 @@ constexpr std::uint8_t kChassisTypeUnknown = 2;
 constexpr std::uint8_t kChassisTypeBlade = 28;
 constexpr std::uint8_t kChassisTypeBladeEnclosure = 29;
 
-// Without the bit that tells of a lock.
-TFinding<std::uint8_t> ChassisTypeOf(TSmbiosStructure const& chassis) {
-  auto const type = chassis.Byte(0x05);
-  if (!type) return type.Why();
-  std::uint8_t const number = *type & 0x7f;
-  if (number == kChassisTypeUnknown) return Unknown();
-  if (number == 0 || number > std::size(kChassisTypes))
-    return TMissing{kMissingUnexpected, "not in the expected form: chassis type " + std::to_string(number)};
-  return number;
+// The highest bit of the type states whether the chassis has a lock.
+constexpr std::uint8_t kChassisLockBit = 0x80;
+
+TFinding<std::uint8_t> ChassisTypeFrom(std::uint8_t field) {
+  std::uint8_t const type = field & ~kChassisLockBit;
+  if (type == kChassisTypeUnknown) return Unknown();
+  if (type == 0 || type > std::size(kChassisTypes))
+    return TMissing{kMissingUnexpected, "not in the expected form: chassis type " + std::to_string(type)};
+  return type;
 }
 
-// CIM numbers the types as SMBIOS does, but knows no blade, and an enclosure of blades by the number before.
-TFinding<std::uint16_t> ChassisPackageTypeOf(TSmbiosStructure const& chassis) {
-  auto const type = ChassisTypeOf(chassis);
-  if (!type) return type.Why();
-  if (*type == kChassisTypeBlade) return std::uint16_t(kChassisTypeOther);
-  if (*type == kChassisTypeBladeEnclosure) return std::uint16_t(kChassisTypeBladeEnclosure - 1);
-  return std::uint16_t(*type);
+TFinding<std::uint8_t> ChassisTypeOf(TSmbiosStructure const& chassis) { return chassis.Byte(0x05).Then(ChassisTypeFrom); }
+
+// CIM numbers the types as SMBIOS does, but has no blade, and gives a blade enclosure the number before.
+std::uint16_t PackageTypeFrom(std::uint8_t chassisType) {
+  if (chassisType == kChassisTypeBlade) return kChassisTypeOther;
+  if (chassisType == kChassisTypeBladeEnclosure) return kChassisTypeBladeEnclosure - 1;
+  return chassisType;
 }
 
-TFinding<std::string> ChassisTypeNameOf(TSmbiosStructure const& chassis) {
-  auto const type = ChassisTypeOf(chassis);
-  if (!type) return type.Why();
-  return std::string(kChassisTypes[*type - 1]);
-}
+std::string ChassisTypeName(std::uint8_t type) { return kChassisTypes[type - 1]; }
 
 TFinding<bool> LockOf(TSmbiosStructure const& chassis) {
-  auto const type = chassis.Byte(0x05);
-  if (!type) return type.Why();
-  return (*type & 0x80) != 0;
+  return chassis.Byte(0x05).Then([](std::uint8_t type) { return (type & kChassisLockBit) != 0; });
 }
 
-// Rack units of 1.75 inches, in inches.
+// In inches. SMBIOS counts rack units of 1.75 inches.
 TFinding<float> HeightOf(TSmbiosStructure const& chassis) {
-  auto const units = NumberOf<float>(chassis.Byte(0x11), std::uint8_t(0));
-  if (!units) return units.Why();
-  return *units * 1.75f;
+  return NumberOf<float>(chassis.Byte(0x11), std::uint8_t(0)).Then([](float units) { return units * 1.75f; });
 }
 
-// The number of the SKU text stands behind the list of contained elements, whose size the structure gives.
+// The SKU follows the list of contained elements: a count and the size of one, then the elements.
 TFinding<std::string> ChassisSkuOf(TSmbiosStructure const& chassis) {
-  auto const count = chassis.Byte(0x13);
-  auto const size = chassis.Byte(0x14);
-  if (!count) return count.Why();
-  if (!size) return size.Why();
-  return TextOf(chassis, 0x15 + std::size_t(*count) * *size);
+  return chassis.Byte(0x13).Then([&](std::size_t count) {
+    return chassis.Byte(0x14).Then([&](std::size_t size) { return TextOf(chassis, 0x15 + count * size); });
+  });
 }
 
 // ---- Processor ----
@@ -199,47 +190,45 @@ TFinding<std::uint16_t> FamilyOf(TSmbiosStructure const& processor) {
   return NumberOf<std::uint16_t>(family, unknown);
 }
 
-TFinding<std::string> RoleOf(TSmbiosStructure const& processor) {
+TFinding<std::string> RoleFrom(std::uint8_t type) {
   constexpr char const* roles[] = {"Other", "Unknown", "Central Processor", "Math Processor", "DSP Processor", "Video Processor"};
-  auto const type = NumberOf<std::uint8_t>(processor.Byte(0x05), std::uint8_t(2));
-  if (!type) return type.Why();
-  if (*type == 0 || *type > std::size(roles))
-    return TMissing{kMissingUnexpected, "not in the expected form: processor type " + std::to_string(*type)};
-  return std::string(roles[*type - 1]);
+  if (type == 0 || type > std::size(roles))
+    return TMissing{kMissingUnexpected, "not in the expected form: processor type " + std::to_string(type)};
+  return std::string(roles[type - 1]);
 }
 
-// CIM numbers sockets as SMBIOS does, up to the last that it knows.
-TFinding<std::uint16_t> UpgradeMethodOf(TSmbiosStructure const& processor) {
+TFinding<std::string> RoleOf(TSmbiosStructure const& processor) {
+  return NumberOf<std::uint8_t>(processor.Byte(0x05), std::uint8_t(2)).Then(RoleFrom);
+}
+
+// CIM numbers sockets as SMBIOS does, up to the last one in its list.
+std::uint16_t UpgradeMethodFrom(std::uint16_t socket) {
   constexpr std::uint16_t other = 1, last = 56;
-  auto const method = NumberOf<std::uint16_t>(processor.Byte(0x19), std::uint8_t(2));
-  if (!method) return method.Why();
-  return *method > last ? other : *method;
+  return socket > last ? other : socket;
 }
 
-TFinding<std::uint16_t> CpuStatusOf(TSmbiosStructure const& processor) {
-  auto const status = processor.Byte(0x18);
-  if (!status) return status.Why();
-  std::uint16_t const number = *status & 0x07;
-  if (number == 0) return Unknown();
-  return number;
+TFinding<std::uint16_t> UpgradeMethodOf(TSmbiosStructure const& processor) {
+  return NumberOf<std::uint16_t>(processor.Byte(0x19), std::uint8_t(2)).Then(UpgradeMethodFrom);
 }
 
-TFinding<std::uint16_t> DataWidthOf(TSmbiosStructure const& processor) {
+TFinding<std::uint16_t> CpuStatusFrom(std::uint8_t field) {
+  std::uint16_t const status = field & 0x07;
+  if (status == 0) return Unknown();
+  return status;
+}
+
+TFinding<std::uint16_t> DataWidthFrom(std::uint16_t characteristics) {
   constexpr std::uint16_t unknown = 0x02, is64Bit = 0x04;
-  auto const characteristics = processor.Word(0x26);
-  if (!characteristics) return characteristics.Why();
-  if (*characteristics & is64Bit) return std::uint16_t(64);
-  if (*characteristics == 0 || *characteristics & unknown) return Unknown();
+  if (characteristics & is64Bit) return std::uint16_t(64);
+  if (characteristics == 0 || characteristics & unknown) return Unknown();
   return std::uint16_t(32);
 }
 
-// The eight bytes of the processor's identifier, in their order.
-TFinding<std::string> ProcessorIdOf(TSmbiosStructure const& processor) {
-  auto const id = processor.Bytes(0x08, 8);
-  if (!id) return id.Why();
-  if (AreAll(*id, 0)) return TMissing{kMissingNotGiven, "the firmware gives none (all zeros)"};
+// The bytes of the processor's identifier, in their order.
+TFinding<std::string> ProcessorIdFrom(std::vector<unsigned char> const& id) {
+  if (AreAll(id, 0)) return TMissing{kMissingNotGiven, "the firmware gives none (all zeros)"};
   std::string text;
-  for (unsigned char byte : *id) {
+  for (unsigned char byte : id) {
     char digits[3];
     std::snprintf(digits, sizeof digits, "%02X", byte);
     text += digits;
@@ -266,25 +255,26 @@ constexpr int kMemoryTypes[] = {-1, 1,  -1, 2,  6,  7,  8,  9,  10, 11, 12, 13, 
 // A number that SMBIOS gives and the table does not have, such as that of a newer kind of memory, is "Other".
 template <std::size_t N>
 TFinding<std::uint16_t> CimNumberOf(TFinding<std::uint8_t> const& found, int const (&table)[N]) {
-  constexpr std::uint16_t other = 1;
-  if (!found) return found.Why();
-  if (*found >= N) return other;
-  if (table[*found] < 0) return Unknown();
-  return static_cast<std::uint16_t>(table[*found]);
+  return found.Then([&table](std::uint8_t number) -> TFinding<std::uint16_t> {
+    constexpr std::uint16_t other = 1;
+    if (number >= N) return other;
+    if (table[number] < 0) return Unknown();
+    return static_cast<std::uint16_t>(table[number]);
+  });
 }
 
-// In bytes. The size field counts kilobytes or megabytes; from 32 GB on the extended one holds megabytes.
+// The highest bit of the extended fields is reserved.
+std::uint32_t WithoutReservedBit(std::uint32_t number) { return number & 0x7fffffff; }
+
+// In bytes. The size field counts kilobytes or megabytes; from 32 GB on, the extended field counts megabytes.
 TFinding<std::uint64_t> CapacityOf(TSmbiosStructure const& memoryDevice) {
   constexpr std::uint16_t unknown = 0xffff, seeExtended = 0x7fff, inKilobytes = 0x8000;
+  auto const fromMegabytes = [](std::uint64_t megabytes) { return megabytes << 20; };
   auto const size = memoryDevice.Word(0x0c);
-  if (IsNumber(size, seeExtended)) {
-    auto const megabytes = memoryDevice.DWord(0x1c);
-    if (!megabytes) return megabytes.Why();
-    return std::uint64_t(*megabytes & 0x7fffffff) << 20;
-  }
-  auto const number = NumberOf<std::uint64_t>(size, unknown);
-  if (!number) return number.Why();
-  return *number & inKilobytes ? (*number & ~std::uint64_t(inKilobytes)) << 10 : *number << 20;
+  if (IsNumber(size, seeExtended)) return memoryDevice.DWord(0x1c).Then(WithoutReservedBit).Then(fromMegabytes);
+  return NumberOf<std::uint64_t>(size, unknown).Then([fromMegabytes](std::uint64_t number) {
+    return number & inKilobytes ? (number & ~std::uint64_t(inKilobytes)) << 10 : fromMegabytes(number);
+  });
 }
 
 // In transfers per second, by the million, which CIM calls megahertz. 65535 stands for the wider extended field.
@@ -292,9 +282,7 @@ TFinding<std::uint32_t> SpeedOf(TSmbiosStructure const& memoryDevice, std::size_
   constexpr std::uint16_t unknown = 0, seeExtended = 0xffff;
   auto const speed = memoryDevice.Word(offset);
   if (!IsNumber(speed, seeExtended)) return NumberOf<std::uint32_t>(speed, unknown);
-  auto const extended = memoryDevice.DWord(extendedOffset);
-  if (!extended) return extended.Why();
-  return NumberOf<std::uint32_t>(TFinding<std::uint32_t>(*extended & 0x7fffffff), std::uint32_t(0));
+  return NumberOf<std::uint32_t>(memoryDevice.DWord(extendedOffset).Then(WithoutReservedBit), std::uint32_t(unknown));
 }
 
 }  // namespace
@@ -324,7 +312,7 @@ TRecord BiosRecord(TSmbiosStructure const& bios, std::string const& source, unsi
   record.AddKey("SoftwareElementID", "BIOS " + std::to_string(number));
   record.AddKey("TargetOperatingSystem", unknownSystem);
   record.Add("Manufacturer", TextOf(bios, 0x04));
-  record.Add("ReleaseDate", DateOf(TextOf(bios, 0x08)));
+  record.Add("ReleaseDate", TextOf(bios, 0x08).Then(DateFrom));
   record.Add("LoadedStartingAddress", StartAddressOf(bios));
   record.Add("LoadedEndingAddress", EndAddressOf(bios));
   return record;
@@ -339,8 +327,8 @@ TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source
   record.Add("SerialNumber", TextOf(chassis, 0x07));
   record.Add("UserTracking", TextOf(chassis, 0x08));
   record.Add("SKU", ChassisSkuOf(chassis));
-  record.Add("ChassisPackageType", ChassisPackageTypeOf(chassis));
-  record.Add("ChassisTypeDescription", ChassisTypeNameOf(chassis));
+  record.Add("ChassisPackageType", ChassisTypeOf(chassis).Then(PackageTypeFrom));
+  record.Add("ChassisTypeDescription", ChassisTypeOf(chassis).Then(ChassisTypeName));
   record.Add("LockPresent", LockOf(chassis));
   record.Add("Height", HeightOf(chassis));
   record.Add("NumberOfPowerCords", NumberOf<std::uint16_t>(chassis.Byte(0x12), std::uint8_t(0)));
@@ -350,7 +338,7 @@ TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source
 TRecord ProcessorRecord(TSmbiosStructure const& processor, std::string const& source, unsigned number, TSystemName const& name) {
   TRecord record("CIM_Processor", source);
   record.AddKey("SystemCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
-  record.AddKey("SystemName", name);
+  record.AddPropagatedKey("SystemName", name.fName);
   record.AddKey("CreationClassName", "CIM_Processor");
   record.AddKey("DeviceID", "Processor " + std::to_string(number));
   record.Add("Name", TextOf(processor, 0x04));
@@ -361,9 +349,9 @@ TRecord ProcessorRecord(TSmbiosStructure const& processor, std::string const& so
   record.Add("MaxClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x14), std::uint16_t(0)));
   record.Add("CurrentClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x16), std::uint16_t(0)));
   record.Add("ExternalBusClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x12), std::uint16_t(0)));
-  record.Add("DataWidth", DataWidthOf(processor));
-  record.Add("UniqueID", ProcessorIdOf(processor));
-  record.Add("CPUStatus", CpuStatusOf(processor));
+  record.Add("DataWidth", processor.Word(0x26).Then(DataWidthFrom));
+  record.Add("UniqueID", processor.Bytes(0x08, 8).Then(ProcessorIdFrom));
+  record.Add("CPUStatus", processor.Byte(0x18).Then(CpuStatusFrom));
   record.Add("NumberOfEnabledCores", EnabledCoresOf(processor));
   return record;
 }

@@ -2,8 +2,9 @@
 #pragma once
 
 #include "SmbiosVersion.h"
-#include "TRecord.h"
 #include "TSmbiosStructure.h"
+#include "TSystemName.h"
+#include "providers/reasons/TRecord.h"
 
 #include <string>
 

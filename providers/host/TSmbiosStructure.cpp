@@ -7,6 +7,17 @@ namespace NQRVZEP20 {
 
 namespace {
 
+template <class T>
+T As(std::uint64_t number) {
+  return static_cast<T>(number);
+}
+
+std::uint64_t LittleEndian(std::vector<unsigned char> const& bytes) {
+  std::uint64_t number = 0;
+  for (std::size_t at = bytes.size(); at-- > 0;) number = number << 8 | bytes[at];
+  return number;
+}
+
 constexpr std::size_t kHeaderSize = 4;
 constexpr std::size_t kLengthOffset = 1;  // of the byte that holds the size of header and formatted area
 
@@ -17,21 +28,15 @@ TSmbiosStructure::TSmbiosStructure(std::vector<unsigned char> bytes) : fBytes(st
 TSmbiosStructure::TSmbiosStructure(TMissing why) : fWhyAbsent(std::move(why)) {}
 
 TFinding<std::uint8_t> TSmbiosStructure::Byte(std::size_t offset) const {
-  auto const number = Number(offset, 1);
-  if (!number) return number.Why();
-  return static_cast<std::uint8_t>(*number);
+  return Bytes(offset, 1).Then(LittleEndian).Then(As<std::uint8_t>);
 }
 
 TFinding<std::uint16_t> TSmbiosStructure::Word(std::size_t offset) const {
-  auto const number = Number(offset, 2);
-  if (!number) return number.Why();
-  return static_cast<std::uint16_t>(*number);
+  return Bytes(offset, 2).Then(LittleEndian).Then(As<std::uint16_t>);
 }
 
 TFinding<std::uint32_t> TSmbiosStructure::DWord(std::size_t offset) const {
-  auto const number = Number(offset, 4);
-  if (!number) return number.Why();
-  return static_cast<std::uint32_t>(*number);
+  return Bytes(offset, 4).Then(LittleEndian).Then(As<std::uint32_t>);
 }
 
 TFinding<std::vector<unsigned char>> TSmbiosStructure::Bytes(std::size_t offset, std::size_t count) const {
@@ -41,27 +46,21 @@ TFinding<std::vector<unsigned char>> TSmbiosStructure::Bytes(std::size_t offset,
 }
 
 TFinding<std::string> TSmbiosStructure::Text(std::size_t offset) const {
-  auto const number = Byte(offset);
-  if (!number) return number.Why();
-  if (*number == 0) return TMissing{kMissingNotGiven, "the firmware gives no text"};
+  return Byte(offset).Then([this](std::uint8_t number) { return StringAt(number); });
+}
+
+TFinding<std::string> TSmbiosStructure::StringAt(std::uint8_t number) const {
+  if (number == 0) return TMissing{kMissingNotGiven, "the firmware gives no text"};
 
   auto text = fBytes.begin() + FormattedSize();
   for (int at = 1; text != fBytes.end() && *text != 0; ++at) {
     auto const end = std::find(text, fBytes.end(), 0);
     if (end == fBytes.end()) break;
-    if (at == *number) return std::string(text, end);
+    if (at == number) return std::string(text, end);
     text = end + 1;
   }
   return TMissing{kMissingUnexpected,
-                  "the firmware names text " + std::to_string(*number) + ", which its structure does not hold"};
-}
-
-TFinding<std::uint64_t> TSmbiosStructure::Number(std::size_t offset, std::size_t size) const {
-  auto const bytes = Bytes(offset, size);
-  if (!bytes) return bytes.Why();
-  std::uint64_t number = 0;
-  for (std::size_t at = size; at-- > 0;) number = number << 8 | (*bytes)[at];
-  return number;
+                  "the firmware refers to string " + std::to_string(number) + ", which the structure does not contain"};
 }
 
 std::size_t TSmbiosStructure::FormattedSize() const {

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "Finding.h"
+#include "providers/reasons/TFinding.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -38,7 +38,7 @@ public:
   TFinding<std::string> Text(std::size_t offset) const;
 
 private:
-  TFinding<std::uint64_t> Number(std::size_t offset, std::size_t size) const;
+  TFinding<std::string> StringAt(std::uint8_t number) const;
   std::size_t FormattedSize() const;
 
   std::vector<unsigned char> fBytes;

@@ -37,10 +37,11 @@ TRoom const kRooms[] = {
     {"platform/ipmi", {"platform/include"}},
     {"platform/usblan", {"platform/include"}},
     {"providers/memory", {"include"}},
+    {"providers/reasons", {"include", "providers/memory"}},
     {"providers/mof", {"include", "providers/memory"}},
-    {"providers/host", {"include", "providers/memory", "platform/include"}},
-    {"collect", {"include", "providers/memory", "providers/mof", "tools/zep"}},
-    {"tools/zep", {"include", "providers/memory", "providers/mof", "collect"}},
+    {"providers/host", {"include", "providers/memory", "providers/reasons", "platform/include"}},
+    {"collect", {"include", "providers/memory", "providers/mof", "providers/reasons", "tools/zep"}},
+    {"tools/zep", {"include", "providers/memory", "providers/mof", "providers/reasons", "collect"}},
 };
 
 fs::path const kSource = ZEP_SOURCE_DIR;
@@ -78,7 +79,7 @@ std::string RoomOf(fs::path folder) {
 std::string RoomNamedBy(std::string const& include, fs::path const& source) {
   if (fs::exists(kSource / include)) return RoomOf(fs::path(include).parent_path());
   if (fs::exists(source.parent_path() / include)) return RoomOf(fs::relative(source.parent_path(), kSource));
-  for (char const* flat : {"include", "platform/include", "providers/memory", "providers/mof"})
+  for (char const* flat : {"include", "platform/include", "providers/memory", "providers/mof", "providers/reasons"})
     if (fs::exists(kSource / flat / include)) return flat;
   return "nowhere";
 }

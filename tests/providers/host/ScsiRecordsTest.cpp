@@ -70,9 +70,9 @@ TEST_F(ScsiRecordsTest, EveryTypeHasItsName) {
       {"15", "Optical Card Device"},
       {"16", "Unknown Device, type 16"},
       {"31", "Unknown Device, type 31"},
-      {"32", "<\"32\" is no type of SCSI devices>"},
-      {"x", "<\"x\" is no type of SCSI devices>"},
-      {"-1", "<\"-1\" is no type of SCSI devices>"},
+      {"32", "<\"32\" is not a SCSI device type>"},
+      {"x", "<\"x\" is not a SCSI device type>"},
+      {"-1", "<\"-1\" is not a SCSI device type>"},
   };
   for (TRow const& row : rows) {
     fDevices.Add("0:0:0:0", row.type, "V", "M", "R");

@@ -75,16 +75,17 @@ TEST(SystemRecordTest, TheNameAndTheTableHaveSourcesOfTheirOwn) {
 
 TEST(SystemRecordTest, PlaceholdersAndWhatIsNotGivenAreNullForTheirReason) {
   TRecord const record = SystemRecordOf(System().Text(0x04, "System manufacturer").Text(0x05, " ").Byte(0x07, 9));
-  ExpectProperties(record,
-                   {{"CreationClassName", "string QRVSG_ComputerSystem"},
-                    {"Name", "string db1"},
-                    {"Manufacturer", "string NULL placeholder: placeholder text of the firmware: \"System manufacturer\""},
-                    {"ProductName", "string NULL not-given: the firmware gives a blank text"},
-                    {"Version", std::string("string ") + kNoText},
-                    {"SerialNumber", "string NULL unexpected-form: the firmware names text 9, which its structure does not hold"},
-                    {"UUID", "string NULL not-given: the firmware gives none (all zeros)"},
-                    {"SKUNumber", std::string("string ") + kNoText},
-                    {"Family", std::string("string ") + kNoText}});
+  ExpectProperties(
+      record,
+      {{"CreationClassName", "string QRVSG_ComputerSystem"},
+       {"Name", "string db1"},
+       {"Manufacturer", "string NULL placeholder: placeholder text of the firmware: \"System manufacturer\""},
+       {"ProductName", "string NULL not-given: the firmware gives a blank text"},
+       {"Version", std::string("string ") + kNoText},
+       {"SerialNumber", "string NULL unexpected-form: the firmware refers to string 9, which the structure does not contain"},
+       {"UUID", "string NULL not-given: the firmware gives none (all zeros)"},
+       {"SKUNumber", std::string("string ") + kNoText},
+       {"Family", std::string("string ") + kNoText}});
 }
 
 TEST(SystemRecordTest, TheVersionDecidesTheByteOrderOfTheUuid) {
@@ -103,7 +104,7 @@ TEST(SystemRecordTest, TheVersionDecidesTheByteOrderOfTheUuid) {
 
 TEST(SystemRecordTest, AUuidThatNobodySetIsNull) {
   EXPECT_EQ(PropertyOf(SystemRecordOf(System().Bytes(0x08, std::string(16, '\xff'))), "UUID"),
-            "string NULL not-given: the firmware leaves it to be set (all ones)");
+            "string NULL not-given: not set by the firmware (all ones)");
   std::string const counted = "\x00\x02\x00\x03\x00\x04\x00\x05\x00\x06\x00\x07\x00\x08\x00\x09"s;
   EXPECT_EQ(PropertyOf(SystemRecordOf(System().Bytes(0x08, counted)), "UUID"),
             "string NULL placeholder: placeholder text of the firmware: \"03000200-0400-0500-0006-000700080009\"");
@@ -163,7 +164,7 @@ TEST(BiosRecordTest, WhatIsNoDateSaysSo) {
        {"2024-03-14", "3/14/2024", "13/01/2024", "00/10/2024", "02/30/2024", "02/29/2023", "02/29/1900", "04/31/2024",
         "01/00/2024", "01/32/2024", "03/14/20245", "March 2024", "aa/bb/cccc", "03/14/2024 "})
     EXPECT_EQ(PropertyOf(BiosRecord(Bios().Text(0x08, text).Make(), "", 0), "ReleaseDate"),
-              "datetime NULL unexpected-form: not in the expected form: \"" + text + "\" is no date");
+              "datetime NULL unexpected-form: not in the expected form: \"" + text + "\" is not a date");
   EXPECT_EQ(PropertyOf(BiosRecord(Bios().Make(), "", 0), "ReleaseDate"), std::string("datetime ") + kNoText);
 }
 

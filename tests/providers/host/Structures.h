@@ -3,8 +3,8 @@
 
 // SMBIOS structures for the tests of the host provider.
 
-#include "providers/host/TRecord.h"
 #include "providers/host/TSmbiosStructure.h"
+#include "providers/reasons/TRecord.h"
 #include "tests/SmbiosTables.h"
 
 #include <algorithm>

@@ -89,7 +89,7 @@ TEST(TSmbiosStructureTest, TextsThatAreNotThereAreMissing) {
     SCOPED_TRACE(row.what);
     TSmbiosStructure const structure = StructureOf("\x01\x05\0\0\2"s + row.strings);
     EXPECT_EQ(Said(structure.Text(4)),
-              row.isThere ? "second" : "unexpected-form: the firmware names text 2, which its structure does not hold");
+              row.isThere ? "second" : "unexpected-form: the firmware refers to string 2, which the structure does not contain");
   }
 }
 

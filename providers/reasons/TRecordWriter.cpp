@@ -1,43 +1,42 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "TNamespaceWriter.h"
+#include "TRecordWriter.h"
 
 #include "ICIMQualifierDecl.h"
-#include "providers/memory/TMemoryNamespace.h"
+#include "MissingValueClass.h"
+#include "TMemoryNamespace.h"
 
 namespace NQRVZEP20 {
 
 namespace {
 
-constexpr char const* kValueSource = "ValueSource";
-
 TRecord MissingRecord(std::string const& path, std::string const& property, TMissing const& why) {
-  TRecord record("ZEP_MissingValue", "");
-  record.AddKey("ElementPath", path);
-  record.AddKey("ElementProperty", property);
-  record.Add("Code", TFinding<std::string>(why.fCode));
-  record.Add("Reason", TFinding<std::string>(why.fReason));
+  TRecord record(kMissingValueClass, "");
+  record.AddKey(kElementPath, path);
+  record.AddKey(kElementProperty, property);
+  record.Add(kMissingCode, TFinding<std::string>(why.fCode));
+  record.Add(kMissingReason, TFinding<std::string>(why.fReason));
   return record;
 }
 
 }  // namespace
 
-TNamespaceWriter::TNamespaceWriter(TMemoryNamespace& ns) : fNamespace(ns) {
+TRecordWriter::TRecordWriter(TMemoryNamespace& ns) : fNamespace(ns) {
   fNamespace.CreateQualifierDecl(kValueSource, TMemoryType("string").GetNull(), ICIMQualifierDecl::kScopeProperty,
                                  ICIMQualifierDecl::kFlavorDefault, TCIMContext());
 }
 
-void TNamespaceWriter::Write(TRecord const& record) {
+void TRecordWriter::Write(TRecord const& record) {
   Declare(record);
   AddInstance(record);
 }
 
-void TNamespaceWriter::Write(TRecord const& shape, std::vector<TRecord> const& records, TMissing const& whyNone) {
+void TRecordWriter::Write(TRecord const& shape, std::vector<TRecord> const& records, TMissing const& whyNone) {
   Declare(shape);
   for (TRecord const& record : records) AddInstance(record);
   if (records.empty()) AddMissing(shape.GetClassName(), "", whyNone);
 }
 
-void TNamespaceWriter::Declare(TRecord const& shape) {
+void TRecordWriter::Declare(TRecord const& shape) {
   auto builder = fNamespace.DefineClass(shape.GetClassName());
   for (TRecordProperty const& property : shape.GetProperties()) {
     TMemoryType const type(property.fValue.GetType());
@@ -46,7 +45,7 @@ void TNamespaceWriter::Declare(TRecord const& shape) {
   }
 }
 
-void TNamespaceWriter::AddInstance(TRecord const& record) {
+void TRecordWriter::AddInstance(TRecord const& record) {
   TMemoryValues values;
   for (TRecordProperty const& property : record.GetProperties())
     if (!property.fValue.IsNull()) values.emplace_back(property.fName, property.fValue);
@@ -56,11 +55,11 @@ void TNamespaceWriter::AddInstance(TRecord const& record) {
     if (property.fValue.IsNull()) AddMissing(path, property.fName, property.fMissing);
 }
 
-void TNamespaceWriter::AddMissing(std::string const& path, std::string const& property, TMissing const& why) {
+void TRecordWriter::AddMissing(std::string const& path, std::string const& property, TMissing const& why) {
   fMissing.push_back(MissingRecord(path, property, why));
 }
 
-void TNamespaceWriter::WriteMissing() {
+void TRecordWriter::WriteMissing() {
   Declare(MissingRecord("", "", {}));
   for (TRecord const& record : fMissing) AddInstance(record);
 }

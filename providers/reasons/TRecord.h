@@ -1,0 +1,75 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "TCIMValue.h"
+#include "TFinding.h"
+
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+// One property of an instance: its value, or the reason why that is missing, and the source.
+struct TRecordProperty {
+  std::string fName;
+  TCIMValue fValue;  // NULL when it is missing, but always of the property's type
+  bool fIsKey;
+  std::string fSource;  // empty when the provider itself chose the value
+  TMissing fMissing;    // only when the value is NULL
+};
+
+// An instance before it is written to a namespace (TRecordWriter): its properties in the order in which they were added, each
+// with a value or a reason.
+//
+//   TRecord record("X_Disk", "sysfs");
+//   record.AddKey("Name", "sda");
+//   record.Add("Model", ReadLine("/sys/block/sda/device/model"));
+//
+// The records of one class must have the same properties in the same order: each of them can serve to declare the class.
+// A plain value: a copy is deep.
+class TRecord {
+public:
+  // `source`: where the values come from, a short text for people, such as "sysfs" or "SMBIOS type 17".
+  TRecord(std::string className, std::string source) : fClassName(std::move(className)), fSource(std::move(source)) {}
+
+  // Sets the source of the properties that are added afterwards.
+  void SetSource(std::string source) { fSource = std::move(source); }
+
+  // A key property whose value the provider itself chooses; it has no source.
+  void AddKey(std::string name, TCIMValue value) { fProperties.push_back({std::move(name), std::move(value), true, "", {}}); }
+
+  // A key property whose value comes from the source.
+  template <class T>
+  void AddKey(std::string name, TFinding<T> const& finding) {
+    Add(std::move(name), finding);
+    fProperties.back().fIsKey = true;
+  }
+
+  // A key property that repeats a key of another instance, such as the name of the system that a disk belongs to. It has no
+  // source: that of the other instance applies.
+  template <class T>
+  void AddPropagatedKey(std::string name, TFinding<T> const& finding) {
+    AddKey(std::move(name), finding);
+    fProperties.back().fSource.clear();
+  }
+
+  // Any other property. Its type is the CIM type of T, also when the value is missing.
+  template <class T>
+  void Add(std::string name, TFinding<T> const& finding) {
+    if (finding)
+      fProperties.push_back({std::move(name), TCIMValue(*finding), false, fSource, {}});
+    else
+      fProperties.push_back({std::move(name), TCIMValue(TCIMValue(T()).GetType(), 0), false, fSource, finding.Why()});
+  }
+
+  std::string const& GetClassName() const { return fClassName; }
+  std::vector<TRecordProperty> const& GetProperties() const { return fProperties; }
+
+private:
+  std::string fClassName;
+  std::string fSource;
+  std::vector<TRecordProperty> fProperties;
+};
+
+}  // namespace NQRVZEP20
