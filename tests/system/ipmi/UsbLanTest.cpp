@@ -52,8 +52,8 @@ protected:
 };
 
 TEST_F(UsbLanTest, WithoutSuchAnInterfaceThereIsNoNode) {
-  EXPECT_EQ(nodes_(), 0);
-  EXPECT_EQ(query_(0), 0);
+  EXPECT_EQ(fNodes(), 0);
+  EXPECT_EQ(fQuery(0), 0);
   EXPECT_EQ(fBringUp(0), ENODEV);
   EXPECT_EQ(AddressesOf("lo"), "127.0.0.1/8 ") << "loopback is left alone";
 }
@@ -61,11 +61,11 @@ TEST_F(UsbLanTest, WithoutSuchAnInterfaceThereIsNoNode) {
 TEST_F(UsbLanTest, AnInterfaceGetsAnAddressInTheControllersRange) {
   RunShell("ip link add bmc0 type veth peer name bmc1");
   ::setenv("ZEP_USBLAN_INTERFACES", "bmc0 bmc1", 1);
-  EXPECT_EQ(nodes_(), 2);
-  EXPECT_EQ(query_(0), 0);
+  EXPECT_EQ(fNodes(), 2);
+  EXPECT_EQ(fQuery(0), 0);
   EXPECT_EQ(fBringUp(0), 0);
-  EXPECT_EQ(query_(0), 1);
-  EXPECT_EQ(query_(1), 0) << "the other is left alone";
+  EXPECT_EQ(fQuery(0), 1);
+  EXPECT_EQ(fQuery(1), 0) << "the other is left alone";
   EXPECT_EQ(AddressesOf("bmc0"), "169.254.95.1/24 ");
   EXPECT_EQ(AddressesOf("bmc1"), "");
   EXPECT_EQ(fBringUp(1), 0);
@@ -73,7 +73,7 @@ TEST_F(UsbLanTest, AnInterfaceGetsAnAddressInTheControllersRange) {
   EXPECT_EQ(fBringUp(1), 0) << "once more changes nothing";
   EXPECT_EQ(AddressesOf("bmc1"), "169.254.96.1/24 ");
   for (int node : {-1, 2, 16, 2147483647}) {
-    EXPECT_EQ(query_(node), 0) << node;
+    EXPECT_EQ(fQuery(node), 0) << node;
     EXPECT_EQ(fBringUp(node), ENODEV) << node;
   }
 }
@@ -81,9 +81,9 @@ TEST_F(UsbLanTest, AnInterfaceGetsAnAddressInTheControllersRange) {
 TEST_F(UsbLanTest, AMissingInterfaceMovesNoOtherToItsNode) {
   RunShell("ip link add bmc0 type veth peer name bmc1 && ip link add verylongname012 type veth peer name far0");
   ::setenv("ZEP_USBLAN_INTERFACES", "absent bmc0 verylongname0123 bmc1", 1);
-  EXPECT_EQ(nodes_(), 4);
+  EXPECT_EQ(fNodes(), 4);
   for (int missing : {0, 2}) {
-    EXPECT_EQ(query_(missing), 0) << missing;
+    EXPECT_EQ(fQuery(missing), 0) << missing;
     EXPECT_EQ(fBringUp(missing), ENODEV) << missing;
   }
   EXPECT_EQ(fBringUp(1), 0);
@@ -97,13 +97,13 @@ TEST_F(UsbLanTest, OtherAddressesStay) {
   RunShell(
       "ip link add bmc0 type veth peer name far0 && ip addr add 10.1.2.3/24 dev bmc0 && ip addr add 169.254.95.1/24 dev bmc0");
   ::setenv("ZEP_USBLAN_INTERFACES", "bmc0", 1);
-  EXPECT_EQ(query_(0), 0) << "it is down";
+  EXPECT_EQ(fQuery(0), 0) << "it is down";
   EXPECT_EQ(fBringUp(0), 0) << "the address being there already";
-  EXPECT_EQ(query_(0), 1);
+  EXPECT_EQ(fQuery(0), 1);
   EXPECT_EQ(AddressesOf("bmc0"), "10.1.2.3/24 169.254.95.1/24 ");
 
   RunShell("ip addr flush dev bmc0 && ip addr add 169.254.7.8/16 dev bmc0");
-  EXPECT_EQ(query_(0), 1) << "the whole range is reached";
+  EXPECT_EQ(fQuery(0), 1) << "the whole range is reached";
   EXPECT_EQ(fBringUp(0), 0);
   EXPECT_EQ(AddressesOf("bmc0"), "169.254.7.8/16 ");
 }
@@ -116,7 +116,7 @@ TEST_F(UsbLanTest, WithoutTheRightToConfigureItSaysSo) {
   int status = 0;
   ::waitpid(child, &status, 0);
   EXPECT_EQ(WEXITSTATUS(status), EPERM);
-  EXPECT_EQ(query_(0), 0);
+  EXPECT_EQ(fQuery(0), 0);
 }
 
 // ---- The link over it ----
