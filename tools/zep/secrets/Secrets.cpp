@@ -11,6 +11,7 @@
 #include <iostream>
 #include <streambuf>
 #include <utility>
+#include <vector>
 
 namespace NQRVZEP20::zep {
 
@@ -60,19 +61,35 @@ bool IsWordAt(std::string const& text, std::size_t at, std::size_t length) {
   return (at == 0 || !isLetter(at - 1)) && !isLetter(at + length);
 }
 
-void Replace(std::string& text, std::string_view secret) {
-  constexpr std::size_t kShort = 4;
-  for (std::size_t at = 0; (at = text.find(secret, at)) != text.npos;) {
-    bool const isHidden = secret.size() >= kShort || IsWordAt(text, at, secret.size());
-    if (isHidden) text.replace(at, secret.size(), kStars);
-    at += isHidden ? kStars.size() : 1;
-  }
-}
-
-// Where a password lies within a text; of size 0 when there is none.
+// Where a password is within a text; of size 0 when there is none.
 struct TSpan {
   std::size_t fStart = 0, fSize = 0;
 };
+
+// Replaces the spans, which are in order and do not overlap, by stars. One pass: a long text may repeat a password often.
+void HideSpans(std::string& text, std::vector<TSpan> const& spans) {
+  if (spans.empty()) return;
+  std::string hidden;
+  std::size_t done = 0;
+  for (TSpan const& span : spans) {
+    hidden.append(text, done, span.fStart - done).append(kStars);
+    done = span.fStart + span.fSize;
+  }
+  hidden.append(text, done);
+  Wipe(text.data(), text.size());
+  text = std::move(hidden);
+}
+
+void Replace(std::string& text, std::string_view secret) {
+  constexpr std::size_t kShort = 4;
+  std::vector<TSpan> spans;
+  for (std::size_t at = 0; (at = text.find(secret, at)) != text.npos;) {
+    bool const isHidden = secret.size() >= kShort || IsWordAt(text, at, secret.size());
+    if (isHidden) spans.push_back({at, secret.size()});
+    at += isHidden ? secret.size() : 1;
+  }
+  HideSpans(text, spans);
+}
 
 // The colon behind the user (or the host), none of those in an IPv6 address.
 std::size_t ColonOf(std::string_view word) {
@@ -119,26 +136,29 @@ TSpan SpanInBareWord(std::string_view word) {
 
 // Hides the passwords of all URLs in the text.
 void ReplaceInUrls(std::string& text) {
+  std::vector<TSpan> spans;
   for (std::size_t at = 0; (at = text.find("://", at)) != text.npos;) {
     at += 3;
     std::size_t const end = std::min(text.find_first_of(std::string(kBlanks) + std::string(kEndsOfUrl), at), text.size());
     TSpan const span = SpanInPlace(std::string_view(text).substr(at, end - at));
-    if (span.fSize > 0) text.replace(at + span.fStart, span.fSize, kStars);
+    if (span.fSize == 0) continue;
+    spans.push_back({at + span.fStart, span.fSize});
+    at = spans.back().fStart + span.fSize;  // a "://" within a password begins no further one
   }
+  HideSpans(text, spans);
 }
 
 // Hides the passwords of all words without a scheme.
 void ReplaceInBareWords(std::string& text) {
+  std::vector<TSpan> spans;
   for (std::size_t at = 0; (at = text.find_first_not_of(kBlanks, at)) != text.npos;) {
-    std::size_t end = std::min(text.find_first_of(kBlanks, at), text.size());
+    std::size_t const end = std::min(text.find_first_of(kBlanks, at), text.size());
     std::string_view const word = std::string_view(text).substr(at, end - at);
     TSpan const span = word.find("://") == word.npos ? SpanInBareWord(word) : TSpan();
-    if (span.fSize > 0) {
-      text.replace(at + span.fStart, span.fSize, kStars);
-      end = end - span.fSize + kStars.size();
-    }
+    if (span.fSize > 0) spans.push_back({at + span.fStart, span.fSize});
     at = end;
   }
+  HideSpans(text, spans);
 }
 
 // std::cerr's, which holds back a line until it is whole: a password may be written in pieces.

@@ -11,6 +11,7 @@
 
 #include <gmock/gmock.h>
 
+#include <ctime>
 #include <type_traits>
 #include <vector>
 
@@ -19,6 +20,19 @@ namespace {
 
 using testing::HasSubstr;
 using testing::Not;
+
+// Quadratic work takes minutes here.
+TEST(SecretsTest, ALongTextThatRepeatsPasswordsIsMadeSafeQuickly) {
+  Hide("0000");
+  std::string text, expected;
+  for (int i = 0; i < 400000; ++i) {
+    text += "0000 ftp://u:topsecret@h/f u:another1@h\n";
+    expected += "*** ftp://u:***@h/f u:***@h\n";
+  }
+  std::clock_t const start = std::clock();
+  EXPECT_TRUE(MessageWithoutSecrets(text) == expected);
+  EXPECT_LT(double(std::clock() - start) / CLOCKS_PER_SEC, 30);
+}
 
 TEST(SecretsTest, ThePasswordOfAUrlIsHiddenInEveryText) {
   struct TRow {
@@ -33,6 +47,7 @@ TEST(SecretsTest, ThePasswordOfAUrlIsHiddenInEveryText) {
       {"ftp://[::1]/a@b", "ftp://[::1]/a@b"},
       {"sftp://u:topsecret@[::1]:22/x, ftp://v:another1@h", "sftp://u:***@[::1]:22/x, ftp://v:***@h"},
       {"u:plain@h and Host:Test_Class.Key=\"a@b\"", "u:plain@h and Host:Test_Class.Key=\"a@b\""},
+      {"ftp://u:a://b:c@h", "ftp://u:***@h"},
       {"://", "://"},
       {"", ""},
   };
