@@ -35,7 +35,8 @@ protected:
 
   TRun Run(std::vector<std::string> const& arguments, std::string const& directory = "work") {
     TCall call = {arguments};
-    call.environment = {{"ZEP_SMBIOS_TABLE", "/nowhere"}, {"HOME", "/nowhere"}, {"NETRC", "/dev/null"}};
+    call.environment = {
+        {"ZEP_SMBIOS_TABLE", "/nowhere"}, {"HOME", "/nowhere"}, {"NETRC", "/dev/null"}, {"TMPDIR", fZep.Path("work")}};
     call.directory = fZep.Path(directory);
     call.hasNoTerminal = true;
     return fZep.Run(call);
