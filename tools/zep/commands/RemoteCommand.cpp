@@ -37,7 +37,7 @@ using namespace std::string_literals;
 struct TArguments {
   std::string fHost, fHostsFile, fUser, fPasswordFile, fDebugLog;
   int fParallel = 32;
-  int fTimeoutSeconds = 30;
+  int fTimeoutSeconds = 120;
   bool fAsJson = false;
 };
 
@@ -120,10 +120,11 @@ int AskAll(std::vector<std::string> const& hosts, TAccount const& account, TArgu
   std::size_t complete = 0, nothing = 0;
   TProcessLimits const limits = {static_cast<std::size_t>(arguments.fParallel), arguments.fTimeoutSeconds};
   RunInProcesses(
-      hosts.size(), limits, [&](std::size_t item) { return AskController(hosts[item], account); },
+      hosts.size(), limits, [&](std::size_t item, TSend const& send) { AskController(hosts[item], account, send); },
       [&](TProcessResult const& result) {
         TRemoteIdentity identity = IdentityFrom(hosts[result.fItem], result.fOutput, result.fIsComplete);
-        if (result.fIsTimeUp) identity.fError = "not done after " + std::to_string(arguments.fTimeoutSeconds) + " s";
+        if (result.fIsTimeUp)
+          identity.fError = "not done after " + std::to_string(arguments.fTimeoutSeconds) + " s; --timeout allows more";
         complete += IsComplete(identity);
         nothing += IsNothing(identity);
         report(identity);

@@ -21,7 +21,7 @@ namespace {
 
 using TClock = std::chrono::steady_clock;
 
-constexpr char kEnd = '\0';  // of each field in what a process says
+constexpr char kEnd = '\0';  // of each field that the child process sends
 
 // One part of the identity, as the controller's FRU data hold it.
 class TField {
@@ -33,7 +33,7 @@ public:
 
   // Memory that was never written holds 0xFF everywhere.
   bool IsNotProgrammed() const { return !fText.empty() && fText.find_first_not_of('\xff') == std::string::npos; }
-  bool IsTold() const { return !GetValue().empty() && fText != "N/A"; }
+  bool IsKnown() const { return !GetValue().empty() && fText != "N/A"; }
 
   // Without the blanks and the unwritten memory at its end.
   std::string GetValue() const { return fText.substr(0, fText.find_last_not_of(" \xff") + 1); }
@@ -43,13 +43,13 @@ private:
   std::string fText;
 };
 
-// Why not all of the fields are told; empty when all are.
+// Why some fields are unknown; empty when all are known.
 std::string WhyNotAll(std::vector<TField> const& fields) {
   std::string notProgrammed;
   bool isOtherMissing = false;
   for (TField const& field : fields) {
     if (field.IsNotProgrammed()) notProgrammed += (notProgrammed.empty() ? "" : ", ") + field.GetName();
-    isOtherMissing = isOtherMissing || (!field.IsTold() && !field.IsNotProgrammed());
+    isOtherMissing = isOtherMissing || (!field.IsKnown() && !field.IsNotProgrammed());
   }
   if (notProgrammed.empty()) return isOtherMissing ? "the controller did not tell everything" : "";
   return "not programmed in the controller's FRU data (0xFF): " + notProgrammed +
@@ -62,10 +62,12 @@ std::string WithoutASession(TClock::time_point start, std::string const& why) {
   return std::string(3, kEnd) + "no session with its controller after " + seconds + ": " + why + kEnd;
 }
 
-std::string TakeField(std::string& said) {
-  std::size_t const end = said.find(kEnd);
-  std::string field = said.substr(0, end);
-  said.erase(0, end == said.npos ? end : end + 1);
+// The next field; empty when the text does not hold its end.
+std::string TakeField(std::string& sent) {
+  std::size_t const end = sent.find(kEnd);
+  if (end == sent.npos) return "";
+  std::string field = sent.substr(0, end);
+  sent.erase(0, end + 1);
   return field;
 }
 
@@ -84,33 +86,33 @@ bool IsHostName(std::string const& host) {
   return isZone && ::inet_pton(AF_INET6, host.substr(0, zone).c_str(), &address) == 1;
 }
 
-std::string AskController(std::string const& host, TAccount const& account) {
-  if (!IsHostName(host)) return std::string(3, kEnd) + kNoHostName + kEnd;
+void AskController(std::string const& host, TAccount const& account, TSend const& send) {
+  if (!IsHostName(host)) return send(std::string(3, kEnd) + kNoHostName + kEnd);
   auto const start = TClock::now();
   std::string const why = WhyNoSession(host, account);
-  if (!why.empty()) return WithoutASession(start, why);
+  if (!why.empty()) return send(WithoutASession(start, why));
   std::string const password = account.fPassword.ForLibrary();
-  std::string const answer = TOSSpecific::GetRemoteMT(host, account.fUser, password);
-  if (answer.empty()) return WithoutASession(start, "it gave one, but not a second time");
-  std::vector<TField> const fields = {
-      {"machine type", answer},
-      {"model", TOSSpecific::GetRemoteMachineModel(host, account.fUser, password)},
-      {"serial number", TOSSpecific::GetRemoteMSN(host, account.fUser, password)},
+  std::string const type = TOSSpecific::GetRemoteMT(host, account.fUser, password);
+  if (type.empty()) return send(WithoutASession(start, "the session could not be reopened"));
+  std::vector<TField> fields;
+  auto const add = [&](char const* name, std::string const& text) {
+    TField const& field = fields.emplace_back(name, text);
+    send((field.IsKnown() ? field.GetValue() : "") + kEnd);
   };
+  add("machine type", type);
+  add("model", TOSSpecific::GetRemoteMachineModel(host, account.fUser, password));
+  add("serial number", TOSSpecific::GetRemoteMSN(host, account.fUser, password));
   IIPMILan::GetInstance()->IpmilanCloseConnect();
-
-  std::string said;
-  for (TField const& field : fields) said += (field.IsTold() ? field.GetValue() : "") + kEnd;
-  return said + WhyNotAll(fields) + kEnd;
+  send(WhyNotAll(fields) + kEnd);
 }
 
-TRemoteIdentity IdentityFrom(std::string const& host, std::string const& said, bool isComplete) {
+TRemoteIdentity IdentityFrom(std::string const& host, std::string const& sent, bool isComplete) {
   TRemoteIdentity identity;
   identity.fHost = host;
-  std::string rest = isComplete ? said : "";
+  std::string rest = sent;
   for (std::string* field : {&identity.fType, &identity.fModel, &identity.fSerialNumber, &identity.fError})
     *field = TakeField(rest);
-  if (!isComplete) identity.fError = "the process that asked its controller did not come to its end";
+  if (!isComplete) identity.fError = "the process that queried the controller ended before it was done";
   return identity;
 }
 

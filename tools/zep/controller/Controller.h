@@ -2,6 +2,7 @@
 #pragma once
 
 #include "tools/zep/output/Json.h"
+#include "tools/zep/processes/TChildProcess.h"
 #include "tools/zep/secrets/TSecret.h"
 
 #include <string>
@@ -26,12 +27,12 @@ bool IsHostName(std::string const& host);
 constexpr char const* kNoHostName =
     "not a host name or an address; the account is named by --user, and its password is in --password-file or ZEP_BMC_PASSWORD";
 
-// Asks the controller; to be called in a process of its own. What is not a host name is not asked. The result is for
-// IdentityFrom.
-std::string AskController(std::string const& host, TAccount const& account);
+// Queries the controller, and sends each field as soon as it is known, in the form that IdentityFrom reads; to be called in a
+// child process. Only a host name is queried.
+void AskController(std::string const& host, TAccount const& account, TSend const& send);
 
-// Puts together what the process said. `isComplete` is false when it did not come to its end.
-TRemoteIdentity IdentityFrom(std::string const& host, std::string const& said, bool isComplete);
+// The identity in what the child process sent. `isComplete` is false when the child did not finish.
+TRemoteIdentity IdentityFrom(std::string const& host, std::string const& sent, bool isComplete);
 
 bool IsComplete(TRemoteIdentity const& identity);
 bool IsNothing(TRemoteIdentity const& identity);

@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/processes/Processes.h"
 
-#include "tools/zep/processes/TChildProcess.h"
-
 #include <poll.h>
 #include <signal.h>
 
@@ -53,7 +51,6 @@ bool GoesOn(TProcess& process, bool saysSomething) {
 // The items: those that are worked on, and how many of all have been taken up.
 class TItems {
 public:
-  using TWork = std::function<std::string(std::size_t)>;
   using TDone = std::function<void(TProcessResult const&)>;
 
   TItems(std::size_t count, TProcessLimits const& limits, TWork const& work, TDone const& done)
@@ -89,7 +86,8 @@ public:
 private:
   void Start(std::size_t item) {
     TClock::time_point const deadline = TClock::now() + std::chrono::seconds(fLimits.fTimeoutSeconds);
-    fRunning.push_back({TChildProcess([&] { return fWork(item); }, SIGTERM), deadline, {item, false, false, {}}});
+    fRunning.push_back(
+        {TChildProcess([&](TSend const& send) { fWork(item, send); }, SIGTERM), deadline, {item, false, false, {}}});
   }
 
   std::size_t const fCount;
@@ -102,7 +100,7 @@ private:
 
 }  // namespace
 
-void RunInProcesses(std::size_t count, TProcessLimits const& limits, std::function<std::string(std::size_t)> const& work,
+void RunInProcesses(std::size_t count, TProcessLimits const& limits, TWork const& work,
                     std::function<void(TProcessResult const&)> const& done) {
   TItems items(count, limits, work, done);
   for (items.TakeUp(); items.IsAnyRunning(); items.TakeUp()) items.Follow();

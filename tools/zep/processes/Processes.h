@@ -1,18 +1,19 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "tools/zep/processes/TChildProcess.h"
+
 #include <functional>
 #include <string>
-#include <vector>
 
 namespace NQRVZEP20::zep {
 
-// What a process of its own made of one item of work.
+// The result of one item of work, which was done in a child process.
 struct TProcessResult {
   std::size_t fItem;
-  bool fIsComplete;  // false: it did not come to its end, and fOutput is what it had said until then
-  bool fIsTimeUp;    // it was ended because its time was up
-  std::string fOutput;
+  bool fIsComplete;     // false: the child did not finish, and fOutput is what it had sent by then
+  bool fIsTimeUp;       // it was ended because its time was up
+  std::string fOutput;  // everything that it sent
 };
 
 struct TProcessLimits {
@@ -20,10 +21,12 @@ struct TProcessLimits {
   int fTimeoutSeconds;    // for each
 };
 
-// Runs `work` for the items 0 to `count` - 1, each in a process of its own, and hands each result to `done` as soon as it is
-// there. The text that `work` returns is the output. Whatever becomes of a process, the rest go on; an item for which none
-// can be made, though no other runs, is not complete. The caller has one thread.
-void RunInProcesses(std::size_t count, TProcessLimits const& limits, std::function<std::string(std::size_t)> const& work,
+using TWork = std::function<void(std::size_t item, TSend const& send)>;
+
+// Runs `work` for the items 0 to `count` - 1, each in a child process, and passes each result to `done` as soon as it is
+// complete. A child that fails does not stop the others. An item for which no process can be made, although no other runs, is
+// not complete. The caller has a single thread.
+void RunInProcesses(std::size_t count, TProcessLimits const& limits, TWork const& work,
                     std::function<void(TProcessResult const&)> const& done);
 
 }  // namespace NQRVZEP20::zep

@@ -28,20 +28,24 @@ pid_t ForkOrThrow() {
   return child;
 }
 
-[[noreturn]] void WorkInChild(std::function<std::string()> const& work, int signalOfOrphan, int output) {
+[[noreturn]] void WorkInChild(std::function<void(TSend const&)> const& work, int signalOfOrphan, int output) {
   ::prctl(PR_SET_PDEATHSIG, signalOfOrphan);
-  bool isWritten = false;
   try {
-    isWritten = WriteWhole(output, work());
+    work([output](std::string_view text) {
+      if (!WriteWhole(output, text)) throw std::system_error(errno, std::generic_category(), "not sent");
+    });
   } catch (...) {
-    // The parent sees that the end is missing.
+    ::_exit(1);  // the owner sees that the end is missing
   }
-  ::_exit(isWritten ? 0 : 1);
+  ::_exit(0);
 }
 
 }  // namespace
 
-TChildProcess::TChildProcess(std::function<std::string()> const& work, int signalOfOrphan) {
+TChildProcess::TChildProcess(std::function<std::string()> const& work, int signalOfOrphan)
+    : TChildProcess([&work](TSend const& send) { send(work()); }, signalOfOrphan) {}
+
+TChildProcess::TChildProcess(std::function<void(TSend const&)> const& work, int signalOfOrphan) {
   TPipe pipe = PipeOrThrow();
   fId = ForkOrThrow();
   if (fId == 0) WorkInChild(work, signalOfOrphan, pipe.fWriteEnd.Get());

@@ -7,30 +7,38 @@
 
 #include <functional>
 #include <string>
+#include <string_view>
 
 namespace NQRVZEP20::zep {
 
-// A process of its own that does one piece of work and says the text that the work returns. One that still runs when its owner
-// goes is killed. Movable; one that was moved from is nothing any more. The caller has one thread.
+// Sends a text from the child to its owner at once. Throws std::system_error when the owner no longer reads.
+using TSend = std::function<void(std::string_view text)>;
+
+// A child process that does one piece of work and sends text to its owner. A child that still runs when its owner is destroyed
+// is killed. Movable; an object that was moved from owns no child. The caller has a single thread.
 class TChildProcess {
 public:
-  // `signalOfOrphan`: what the child is sent when this process dies before it. The child ends without this process's clean-up;
-  // work that throws has said nothing. Throws std::system_error, and leaves nothing open, when there is no pipe or no process.
+  // `signalOfOrphan`: the signal that the child gets when this process dies first. The child ends without this process's
+  // clean-up. Throws std::system_error, and leaves nothing open, when there is no pipe or no process.
+  TChildProcess(std::function<void(TSend const&)> const& work, int signalOfOrphan);
+
+  // The same for work that sends one text at its end. Work that throws sends nothing.
   TChildProcess(std::function<std::string()> const& work, int signalOfOrphan);
+
   ~TChildProcess();
   TChildProcess(TChildProcess&& other) noexcept;
   TChildProcess& operator=(TChildProcess&& other) noexcept;
 
-  pid_t Id() const { return fId; }              // -1 when it has ended
-  int Output() const { return fOutput.Get(); }  // readable when it says something, and at its end
+  pid_t Id() const { return fId; }              // -1 after it has ended
+  int Output() const { return fOutput.Get(); }  // readable when it has sent something, and at its end
 
-  // Adds what it says now to the text; waits until it says something. False when it has said everything.
+  // Waits until the child sends something, and appends it to the text. False when there is nothing more to come.
   bool Read(std::string& text);
 
-  // Waits until it has ended. True when it came to the end of its work and could say all of it.
+  // Waits until the child has ended. True when its work returned and everything was sent.
   bool End();
 
-  // Ends it at once.
+  // Ends the child at once.
   void Kill();
 
 private:

@@ -28,7 +28,7 @@ std::string WithoutHead(TJson document) {
   return document.dump();
 }
 
-TEST(RemoteIdentityTextTest, PutsTogetherWhatTheProcessSaid) {
+TEST(RemoteIdentityTextTest, IsReadFromTheTextThatTheProcessSent) {
   TRemoteIdentity const whole = IdentityFrom("h", kSaid, true);
   EXPECT_TRUE(IsComplete(whole));
   EXPECT_FALSE(IsNothing(whole));
@@ -45,15 +45,26 @@ TEST(RemoteIdentityTextTest, PutsTogetherWhatTheProcessSaid) {
   EXPECT_EQ(AsText(part), "Remote server    h\nMachine type     1234\nModel            unknown\nSerial number    unknown\n");
 }
 
-TEST(RemoteIdentityTextTest, AProcessThatDidNotEndToldNothing) {
-  for (std::string const& said : {""s, "12"s, kSaid}) {
-    TRemoteIdentity const identity = IdentityFrom("h", said, false);
-    EXPECT_TRUE(IsNothing(identity));
-    EXPECT_EQ(identity.fError, "the process that asked its controller did not come to its end");
+TEST(RemoteIdentityTextTest, FieldsSentByAProcessThatDidNotFinishAreKept) {
+  struct {
+    std::string sent, type, model, serialNumber;
+  } const rows[] = {
+      {"", "", "", ""},
+      {"12", "", "", ""},  // a field without its end may be cut
+      {"1234\0AB"s, "1234", "", ""},
+      {"1234\0AB7\0"s, "1234", "AB7", ""},
+      {kSaid, "1234", "AB7", "KQ12345"},
+  };
+  for (auto const& row : rows) {
+    TRemoteIdentity const identity = IdentityFrom("h", row.sent, false);
+    EXPECT_EQ(identity.fType, row.type);
+    EXPECT_EQ(identity.fModel, row.model);
+    EXPECT_EQ(identity.fSerialNumber, row.serialNumber);
+    EXPECT_EQ(identity.fError, "the process that queried the controller ended before it was done");
   }
 }
 
-TEST(RemoteIdentityTextTest, WhatAControllerSaysIsMadePrintable) {
+TEST(RemoteIdentityTextTest, TextOfAControllerIsMadePrintable) {
   TRemoteIdentity const identity = IdentityFrom("h", "12\x1B[2J\0A\xFF\0K\0\0"s, true);
   EXPECT_THAT(AsText(identity), HasSubstr("12\\x1b[2J"));
   EXPECT_THAT(AsText(identity), HasSubstr("A\\xff"));

@@ -29,7 +29,8 @@ double SecondsSince(TClock::time_point start) { return std::chrono::duration<dou
 std::map<std::size_t, TProcessResult> ResultsOf(std::size_t count, TProcessLimits const& limits,
                                                 std::function<std::string(std::size_t)> const& work) {
   std::map<std::size_t, TProcessResult> results;
-  RunInProcesses(count, limits, work, [&](TProcessResult const& result) {
+  auto const sendAll = [&](std::size_t item, TSend const& send) { send(work(item)); };
+  RunInProcesses(count, limits, sendAll, [&](TProcessResult const& result) {
     EXPECT_TRUE(results.emplace(result.fItem, result).second) << "twice the result of " << result.fItem;
   });
   EXPECT_EQ(::waitpid(-1, nullptr, WNOHANG), -1) << "every process should have been waited for";
@@ -133,14 +134,26 @@ TEST(ProcessesTest, NoMoreRunAtOnceThanAllowed) {
 TEST(ProcessesTest, ResultsComeAsSoonAsTheyAreThere) {
   std::vector<std::size_t> order;
   RunInProcesses(
-      3, {3, 60},
-      [](std::size_t item) {
-        Sleep(item == 0 ? 1000 : 0);
-        return std::string();
-      },
+      3, {3, 60}, [](std::size_t item, TSend const&) { Sleep(item == 0 ? 1000 : 0); },
       [&](TProcessResult const& result) { order.push_back(result.fItem); });
   ASSERT_EQ(order.size(), 3u);
   EXPECT_EQ(order.back(), 0u);
+}
+
+TEST(ProcessesTest, TextSentBeforeTheTimeIsUpIsInTheResult) {
+  RunInProcesses(
+      1, {1, 1},
+      [](std::size_t, TSend const& send) {
+        send("first ");
+        send("second");
+        Sleep(30000);
+        send(" third");
+      },
+      [&](TProcessResult const& result) {
+        EXPECT_TRUE(result.fIsTimeUp);
+        EXPECT_FALSE(result.fIsComplete);
+        EXPECT_EQ(result.fOutput, "first second");
+      });
 }
 
 TEST(ProcessesTest, ALongOutputIsTakenWhole) {
@@ -153,9 +166,8 @@ TEST(ProcessesTest, WhatEndsTheListEndsTheProcesses) {
   auto const start = TClock::now();
   EXPECT_THROW(RunInProcesses(
                    2, {2, 60},
-                   [](std::size_t item) {
+                   [](std::size_t item, TSend const&) {
                      if (item == 1) Sleep(30000);
-                     return std::string();
                    },
                    [](TProcessResult const&) { throw std::runtime_error("the disk is full"); }),
                std::runtime_error);
