@@ -94,10 +94,9 @@ TRun AddGetArguments(CLI::App& command) {
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
       "A file that is there is overwritten after a question, which is asked on a terminal only; of a symbolic link the file\n"
-      "that it leads to. Until all has arrived the file has \".part\" after its name. A broken transfer leaves that file, and "
-      "the\n"
-      "next one goes on with it where the server can start in the middle and tells (FTP: by MDTM) that the file has the same\n"
-      "time as before; otherwise all of it is fetched again.\n" +
+      "that it leads to. Until all has arrived the file has \".part\" after its name. A broken transfer leaves that file and a\n"
+      "note of its URL and size, \".part.from\". The next transfer continues the file when the server can start in the middle\n"
+      "and reports (FTP: by MDTM) the same time and size at the same URL; otherwise all of it is fetched again.\n" +
       TransferHelp());
   return [arguments] { return Get(*arguments); };
 }

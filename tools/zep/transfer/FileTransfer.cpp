@@ -6,6 +6,7 @@
 #include "TZEPException.h"
 #include "tools/zep/processes/Descriptor.h"
 #include "tools/zep/transfer/Curl.h"
+#include "tools/zep/transfer/PartNote.h"
 #include "tools/zep/transfer/UrlCoding.h"
 
 #include <fcntl.h>
@@ -77,6 +78,12 @@ public:
   std::int64_t RemoteTime() const {
     curl_off_t time = -1;
     return fCurl.fGetInfo(fHandle, CURLINFO_FILETIME_T, &time) == CURLE_OK ? time : -1;
+  }
+
+  // How many bytes this transfer will bring, -1 when the server does not report it. 0 also when it brings none.
+  std::int64_t BytesToCome() const {
+    curl_off_t bytes = -1;
+    return fCurl.fGetInfo(fHandle, CURLINFO_CONTENT_LENGTH_DOWNLOAD_T, &bytes) == CURLE_OK ? bytes : -1;
   }
 
   std::string ErrorText() const { return fError.data(); }
@@ -294,27 +301,21 @@ private:
 
 class TDownload {
 public:
-  TDownload(std::string const& file, bool isThere, std::uint64_t mostBytes, TTransferState& state)
-      : fPath(file), fMostBytes(mostBytes), fState(state), fIsThere(isThere) {
+  TDownload(TRemote const& remote, std::string const& file, bool isThere, std::uint64_t mostBytes, TTransferState& state)
+      : fUrl(UrlOf(remote)), fShownUrl(ShownUrlOf(remote)), fPath(file), fMostBytes(mostBytes), fState(state), fIsThere(isThere) {
     fConnection.Set(CURLOPT_WRITEFUNCTION, &Write);
     fConnection.Set(CURLOPT_WRITEDATA, this);
     fConnection.Set(CURLOPT_FILETIME, 1L);
-    fConnection.Set(CURLOPT_MAXFILESIZE_LARGE, static_cast<curl_off_t>(mostBytes));  // where the server tells the size
+    fConnection.Set(CURLOPT_MAXFILESIZE_LARGE, static_cast<curl_off_t>(mostBytes));  // where the server reports the size
   }
 
-  void Run(std::string const& url) {
-    struct stat status {};
-    bool const isMarked = fIsThere && ::lstat(fPath.c_str(), &status) == 0 && S_ISREG(status.st_mode) && status.st_size > 0 &&
-                          status.st_mtim.tv_nsec == 0;
-    if (isMarked) {
-      fStart = static_cast<std::uint64_t>(status.st_size);
-      fTimeOfPart = status.st_mtim.tv_sec;
-    }
-    CURLcode code = Fetch(url);
-    if (fStart > 0 && IsStartedAnew(code)) {
+  void Run() {
+    FindStart();
+    CURLcode code = Fetch();
+    if (fStart > 0 && !fFile && IsStartedAnew(code)) {
       fStart = 0;
       fIsOther = false;
-      code = Fetch(url);
+      code = Fetch();
     }
     bool const isWholeTooLarge = code == CURLE_OK && fMostBytes > 0 && fStart > fMostBytes;
     if (code == CURLE_FILESIZE_EXCEEDED || isWholeTooLarge) fState.fIsTooLarge = true;
@@ -324,28 +325,47 @@ public:
   }
 
 private:
-  CURLcode Fetch(std::string const& url) {
-    fState.fMoved = fStart;
-    fConnection.Set(CURLOPT_RESUME_FROM_LARGE, static_cast<curl_off_t>(fStart));
-    return fConnection.Perform(url);
+  // A part is continued when its time is in whole seconds (MarkForResuming) and it has a note.
+  void FindStart() {
+    struct stat status {};
+    bool const isPart = fIsThere && ::lstat(fPath.c_str(), &status) == 0 && S_ISREG(status.st_mode) && status.st_size > 0;
+    if (!isPart || status.st_mtim.tv_nsec != 0) return;
+    fNote = ReadNote(fPath);
+    if (fNote.empty()) return;
+    fStart = static_cast<std::uint64_t>(status.st_size);
+    fTimeOfPart = status.st_mtim.tv_sec;
   }
 
-  // Whether what is there cannot be a beginning: the remote file is another one by now, or the server cannot start in the middle.
+  CURLcode Fetch() {
+    fState.fMoved = fStart;
+    fConnection.Set(CURLOPT_RESUME_FROM_LARGE, static_cast<curl_off_t>(fStart));
+    return fConnection.Perform(fUrl);
+  }
+
+  // Whether the part is the beginning of the remote file, which has that size now.
+  bool IsPartOf(std::int64_t remoteSize) const {
+    return fConnection.RemoteTime() == fTimeOfPart && fNote == NoteFor(fShownUrl, remoteSize);
+  }
+
+  // Whether the part must be replaced: it is of another file, or the server cannot start in the middle.
   bool IsStartedAnew(CURLcode code) {
-    bool const isWhole = code == CURLE_OK && !fFile;  // nothing was missing, if it is the same file
-    if (isWhole) return fConnection.RemoteTime() != fTimeOfPart;
+    if (code == CURLE_OK) return !IsPartOf(static_cast<std::int64_t>(fStart));  // nothing was missing, if it is the same file
     return fIsOther || code == CURLE_BAD_DOWNLOAD_RESUME || code == CURLE_FTP_COULDNT_USE_REST || code == CURLE_RANGE_ERROR;
   }
 
-  // False, with fError or fIsOther, when nothing may be written.
+  // Opens the part when the first bytes have arrived. False, with fError or fIsOther, when nothing may be written.
   bool Open() {
-    fState.fRemoteTime = fConnection.RemoteTime();
-    fIsOther = fStart > 0 && fState.fRemoteTime != fTimeOfPart;
+    std::int64_t const toCome = fConnection.BytesToCome();
+    std::int64_t const size = toCome < 0 ? -1 : toCome + static_cast<std::int64_t>(fStart);
+    fIsOther = fStart > 0 && !IsPartOf(size);
     if (fIsOther) return false;
     int const how = fStart > 0 ? O_APPEND : fIsThere ? O_CREAT | O_TRUNC : O_CREAT | O_EXCL;
     fFile = TDescriptor(::open(fPath.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC | how, 0666));
     if (!fFile) fError = errno;
-    return static_cast<bool>(fFile);
+    if (!fFile) return false;
+    if (fStart == 0) WriteNote(fPath, NoteFor(fShownUrl, size));
+    fState.fRemoteTime = fConnection.RemoteTime();  // only now is it the time of what the part holds
+    return true;
   }
 
   // libcurl's write callback. Another result than the number of bytes ends the transfer.
@@ -372,6 +392,7 @@ private:
   }
 
   TConnection fConnection;
+  std::string const fUrl, fShownUrl;
   std::string const fPath;
   std::uint64_t const fMostBytes;
   TTransferState& fState;
@@ -379,6 +400,7 @@ private:
   bool const fIsThere;            // whether a file of that name was there before
   std::uint64_t fStart = 0;       // what is there of it
   std::int64_t fTimeOfPart = -1;  // the time of that
+  std::string fNote;              // the note of that
   bool fIsOther = false;          // the remote file is not the one that it came from
   int fError = 0;                 // errno of writing
 };
@@ -408,7 +430,7 @@ void RemoveParts(TRemote const& place, TUploadNames const& names, int cleanUpSec
 
 TZEPStatusCode Download(TRemote const& remote, std::string const& file, bool isThere, std::uint64_t mostBytes,
                         TTransferState& state) {
-  TDownload(file, isThere, mostBytes, state).Run(UrlOf(remote));
+  TDownload(remote, file, isThere, mostBytes, state).Run();
   return kZEPStatusOK;
 }
 

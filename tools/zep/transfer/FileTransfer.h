@@ -28,7 +28,8 @@ struct TUploadNames {
 // What the process of a transfer tells of it while it runs, in memory that it shares with zep.
 struct TTransferState {
   std::atomic<std::uint64_t> fMoved{0};       // bytes of the local file, read or written
-  std::atomic<std::int64_t> fRemoteTime{-1};  // when the remote file was changed last, in seconds since 1970; -1: not told
+  std::atomic<std::int64_t> fRemoteTime{-1};  // when the remote file that the part is of was changed last, in seconds since
+                                              // 1970; -1: the server does not report it, or nothing was written
   std::atomic<int> fReadError{0};             // errno, when the file that is sent could not be read
   std::atomic<unsigned> fLeft{0};             // ELeft: what of an upload may be left on the server
   std::atomic<bool> fIsTooLarge{false};       // of a download
@@ -71,10 +72,10 @@ TZEPStatusCode Upload(TRemote const& place, TUploadNames const& names, std::stri
 // Removes the parts that an upload whose process was ended left, on a connection of its own, and clears their bits of fLeft.
 void RemoveParts(TRemote const& place, TUploadNames const& names, int cleanUpSeconds, TTransferState& state);
 
-// Fetches into the file. With `isThere` it may be there: one whose time is that of the remote file (MarkForResuming), is taken
-// for its beginning: the rest is added where the server can start in the middle. Any other is written anew, once the first bytes
-// are there. Without it, one that is there all the same is kZEPStatusAlreadyExists. Ends with fIsTooLarge when the whole would be
-// larger than `mostBytes` (0: any size).
+// Fetches into the file. With `isThere` the file may exist. It is taken for the beginning of the remote file when it has the
+// time of the remote file (MarkForResuming) and its note (PartNote.h) the URL and the size: the rest is then added, if the server
+// can start in the middle. Any other file is replaced once the first bytes arrive, and gets a note. Without `isThere` an existing
+// file is kZEPStatusAlreadyExists. Ends with fIsTooLarge when the whole would be larger than `mostBytes` (0: any size).
 TZEPStatusCode Download(TRemote const& remote, std::string const& file, bool isThere, std::uint64_t mostBytes,
                         TTransferState& state);
 

@@ -9,6 +9,7 @@
 #include "tools/zep/processes/TChildProcess.h"
 #include "tools/zep/secrets/Secrets.h"
 #include "tools/zep/transfer/FileTransfer.h"
+#include "tools/zep/transfer/PartNote.h"
 #include "tools/zep/transfer/Sha256.h"
 #include "tools/zep/transfer/Unreachable.h"
 
@@ -294,6 +295,7 @@ TTransferred BrokenOff(TTransferred transferred, bool wasThere, TTransferState c
   if (state.fIsTooLarge) {
     transferred.fOutcome.fReason = "the file is larger than " + ExactSizeText(options.fMostBytes) + "; --max-size allows more";
     bool const isKept = wasThere || (::unlink(part.c_str()) != 0 && errno != ENOENT);
+    if (!isKept) RemoveNote(part);
     if (!isKept) return transferred;
   } else {
     BlameTheDisk(transferred.fOutcome, part);
@@ -312,6 +314,7 @@ TTransferred Completed(TTransferred transferred, std::string const& file, bool o
   transferred.fSha256 = Sha256Of(part);
   if (!Rename(part, file, overwrites))
     return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + ReasonOf(errno));
+  RemoveNote(part);
   transferred.fFile = file;
   return transferred;
 }
@@ -392,6 +395,7 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
   if (!lock.WhyNotHad().empty()) return Failed(transferred, kExitNotWritten, lock.WhyNotHad());
   bool const isThere = IsRegularFile(part);
   if (!CanMakePart(part, isThere)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
+  if (!isThere) RemoveNote(part);
   TSharedTransferState const state;
   std::uint64_t const most = options.fMostBytes;
   transferred.fOutcome = Transfer([&] { return Download(remote, part, isThere, most, *state); }, *state, 0, options);
