@@ -3,12 +3,14 @@
 // The examples do what the documentation says, and the documentation shows the code of the examples.
 
 #include "TOSSpecific.h"
+#include "TReasonReader.h"
 #include "tests/Support.h"
 #include "zepcore.h"
 
 #include <gmock/gmock.h>
 
 #include <cstdio>
+#include <filesystem>
 #include <memory>
 #include <regex>
 #include <sstream>
@@ -19,6 +21,13 @@ namespace {
 TCIMContext const kNone;
 
 std::string SourceFile(std::string const& name) { return ReadFile(std::string(ZEP_SOURCE_DIR) + "/" + name); }
+
+std::string OutputOf(std::string const& command) {
+  std::unique_ptr<FILE, int (*)(FILE*)> const pipe(::popen(command.c_str(), "r"), ::pclose);
+  std::string output;
+  for (int c; (c = std::fgetc(pipe.get())) != EOF;) output += static_cast<char>(c);
+  return output;
+}
 
 // ---- The plug-in ----
 
@@ -40,7 +49,7 @@ TEST_F(ClockTest, RegistersItselfWithItsNamespace) {
   EXPECT_EQ(TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Clock")->GetNamespace(kNone), fNs);
 }
 
-TEST_F(ClockTest, TellsOfEachClock) {
+TEST_F(ClockTest, EachClockHasAnInstance) {
   for (char const* name : {"realtime", "monotonic", "boottime"}) {
     SCOPED_TRACE(name);
     auto const clock = Find("X_Clock.Name=\"" + std::string(name) + "\"");
@@ -64,14 +73,37 @@ TEST_F(ClockTest, AssociatesClocks) {
   EXPECT_TRUE(associations[0]->GetClass(kNone)->GetClassFlag(kNone));
 }
 
-// ---- The programs ----
+// ---- The plug-in with reasons ----
 
-std::string OutputOf(std::string const& command) {
-  std::unique_ptr<FILE, int (*)(FILE*)> const pipe(::popen(command.c_str(), "r"), ::pclose);
-  std::string output;
-  for (int c; (c = std::fgetc(pipe.get())) != EOF;) output += static_cast<char>(c);
-  return output;
+TEST(BatteriesTest, EachValueHasASourceOrAReason) {
+  TTempDir const dir;
+  for (char const* name : {"BAT0", "BAT1"}) std::filesystem::create_directory(dir.Path(name));
+  WriteFile(dir.Path("BAT0/capacity"), "97\n");
+  WriteFile(dir.Path("BAT1/capacity"), "full\n");
+  TEnvironmentGuard const directory("EXAMPLE_BATTERIES", dir.Path().c_str());
+  TOSSpecific::LoadPluginLibrary(ZEP_BATTERIES_PLUGIN);
+  auto const ns = TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Batteries")->GetNamespace(kNone);
+  auto const find = [&](char const* path) { return ns->GetInstance(TCIMReference(ns, std::string("ns:") + path, kNone), kNone); };
+
+  auto const first = find("X_Battery.Name=\"BAT0\""), second = find("X_Battery.Name=\"BAT1\"");
+  ASSERT_TRUE(first && second);
+  unsigned short const charge = first->GetProperty("Charge", kNone)->GetValue(kNone);
+  EXPECT_EQ(charge, 97);
+
+  TReasonReader const reasons(*ns);
+  EXPECT_FALSE(reasons.WhyMissing(*first, "Charge"));
+  EXPECT_EQ(reasons.WhyMissing(*first, "Model").value().fReason, dir.Path("BAT0/model_name") + " cannot be read");
+  EXPECT_EQ(reasons.WhyMissing(*second, "Charge").value().fCode, "unexpected-form");
+  EXPECT_EQ(reasons.WhyMissing(*second, "Charge").value().fReason, "\"full\" is not a percentage");
+  EXPECT_EQ(TReasonReader::SourceOf(*ns->GetClass("X_Battery", kNone)->GetPropertyDecl("Charge", kNone)), "sysfs");
 }
+
+TEST(BatteriesTest, AMachineWithoutBatteryHasAReason) {
+  std::string const command = "EXAMPLE_BATTERIES=/nowhere " ZEP_LIST_PROVIDER " " ZEP_BATTERIES_PLUGIN;
+  EXPECT_THAT(OutputOf(command), testing::HasSubstr("Reason = the kernel shows no battery\n"));
+}
+
+// ---- The programs ----
 
 TEST(ReadmeExampleTest, PrintsTheMachineTypeAndModelOfTheSample) {
   TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", ZEP_SOURCE_DIR "/tools/zep/sample/smbios.bin");
@@ -110,26 +142,41 @@ std::string FirstBlockOf(std::string const& document, std::string const& languag
   return "";
 }
 
-// Expects that the document's blocks of that language stand in the source file, word for word and in the same order.
-void ExpectBlocksFrom(std::string const& document, std::string const& language, std::string const& sourceName, int count) {
+std::vector<TBlock> BlocksOf(std::string const& document, std::string const& language) {
+  std::vector<TBlock> blocks;
+  for (TBlock const& block : BlocksOf(document))
+    if (block.language == language) blocks.push_back(block);
+  return blocks;
+}
+
+// Expects that the blocks from `first` to before `last` are in the source file, verbatim and in the same order.
+void ExpectBlocksFrom(std::vector<TBlock> const& blocks, std::size_t first, std::size_t last, std::string const& sourceName) {
   std::string const source = SourceFile(sourceName);
   ASSERT_FALSE(source.empty()) << sourceName;
+  ASSERT_LE(last, blocks.size());
   std::size_t position = 0;
-  int found = 0;
-  for (TBlock const& block : BlocksOf(document)) {
-    if (block.language != language) continue;
-    std::size_t const at = source.find(block.text, position);
-    ASSERT_NE(at, std::string::npos) << "not in " << sourceName << ":\n" << block.text;
-    position = at + block.text.size();
-    ++found;
+  for (std::size_t at = first; at < last; ++at) {
+    std::size_t const found = source.find(blocks[at].text, position);
+    ASSERT_NE(found, std::string::npos) << "not in " << sourceName << ":\n" << blocks[at].text;
+    position = found + blocks[at].text.size();
   }
-  EXPECT_EQ(found, count);
+}
+
+// Expects that the document's blocks of that language, so many, are in the source file, verbatim and in the same order.
+void ExpectBlocksFrom(std::string const& document, std::string const& language, std::string const& sourceName,
+                      std::size_t count) {
+  std::vector<TBlock> const blocks = BlocksOf(document, language);
+  EXPECT_EQ(blocks.size(), count);
+  ExpectBlocksFrom(blocks, 0, blocks.size(), sourceName);
 }
 
 TEST(DocumentationTest, ReadmeShowsTheCodeOfTheExample) { ExpectBlocksFrom("README.md", "cpp", "examples/ReadmeExample.cpp", 1); }
 
-TEST(DocumentationTest, WalkThroughShowsTheCodeOfTheExample) {
-  ExpectBlocksFrom("docs/writing-a-provider.md", "cpp", "examples/Clock/Clock.cpp", 6);
+TEST(DocumentationTest, WalkThroughShowsTheCodeOfTheExamples) {
+  std::vector<TBlock> const blocks = BlocksOf("docs/writing-a-provider.md", "cpp");
+  EXPECT_EQ(blocks.size(), 9u);
+  ExpectBlocksFrom(blocks, 0, 6, "examples/Clock/Clock.cpp");
+  ExpectBlocksFrom(blocks, 6, 9, "examples/Batteries/Batteries.cpp");
   ExpectBlocksFrom("docs/writing-a-provider.md", "cmake", "examples/Clock/CMakeLists.txt", 1);
   EXPECT_EQ(FirstBlockOf("docs/writing-a-provider.md", "cmake"), SourceFile("examples/Clock/CMakeLists.txt"));
 }
@@ -147,7 +194,7 @@ TEST(DocumentationTest, TourShowsTheCodeOfTheExampleAndWhatItPrints) {
   EXPECT_NE(ReadFile(dir.Path("tour.log")).find(" the fan turns slowly\n"), std::string::npos);
 }
 
-// Clocks run on: every number behind " = " is as good as another.
+// Clocks go on: the numbers after " = " differ.
 std::string WithoutNumbers(std::string const& text) { return std::regex_replace(text, std::regex(" = \\d+"), " = N"); }
 
 TEST(DocumentationTest, WalkThroughShowsWhatListProviderPrints) {

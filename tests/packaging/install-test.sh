@@ -40,10 +40,16 @@ read -ra flags <<<"$(pkg-config --cflags --libs zepcore)"
 "$cxx" -std=c++17 "$here/consumer/main.cpp" -o "$work/consumer" "${flags[@]}"
 check "the consumer built with pkg-config" "$work/consumer"
 
-# A provider plug-in of somebody else's, as docs/writing-a-provider.md builds it.
+# A provider plug-in of somebody else's, as docs/writing-a-provider.md builds it, and one that states reasons.
 cmake -G Ninja -S "$here/../../examples/Clock" -B "$work/clock" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/clock.log"
 cmake --build "$work/clock" >>"$work/clock.log" || { cat "$work/clock.log" >&2; exit 1; }
 cp "$work/clock/libClock.nsp.so" "$private/"
 "$work/prefix/bin/zep" report --sample >"$work/report" || true  # a machine that tells little is no failure here
 grep -q 'Clock .*root/clock' "$work/report" || { echo "zep does not list the clock plug-in:" >&2; cat "$work/report" >&2; exit 1; }
+
+cmake -G Ninja -S "$here/../../examples/Batteries" -B "$work/batteries" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/batteries.log"
+cmake --build "$work/batteries" >>"$work/batteries.log" || { cat "$work/batteries.log" >&2; exit 1; }
+cp "$work/batteries/libBatteries.nsp.so" "$private/"
+EXAMPLE_BATTERIES="$work/none" "$work/prefix/bin/zep" report --sample --json >"$work/report" || true
+grep -q 'root/batteries' "$work/report" || { echo "zep does not list the batteries plug-in:" >&2; cat "$work/report" >&2; exit 1; }
 echo "the installed tree works"
