@@ -614,10 +614,67 @@ TEST(ZepSlowTransferTest, OneDownloadAtATimeHasTheFile) {
 
 TEST_F(ZepTransferTest, WhatAKilledDownloadLeftIsNoHindrance) {
   WriteFile(Remote("f"), "text");
-  for (char const* name : {"f.part", "f.part.lock"}) Local(name, "old");
+  Local("f.part", "old");
+  Local("f.part.lock", "");
   EXPECT_EQ(Zep("get " + Url("f") + " " + fDir.Path("f")).exitCode, kComplete);
   EXPECT_EQ(ReadFile(fDir.Path("f")), "text");
   EXPECT_EQ(NamesIn(fDir.Path()), std::vector<std::string>{"f"});
+}
+
+TEST_F(ZepTransferTest, AForeignFileWithTheNameOfALockStays) {
+  WriteFile(Remote("f"), "text");
+  std::string const lock = Local("f.part.lock", "letters from home\n");
+  EXPECT_EQ(Zep("get " + Url("f") + " " + fDir.Path("f")).exitCode, kComplete);
+  EXPECT_EQ(ReadFile(fDir.Path("f")), "text");
+  EXPECT_TRUE(fs::exists(lock));
+  fs::remove(lock);
+  ASSERT_EQ(::mkfifo(lock.c_str(), 0600), 0);
+  TProgramRun const run = Zep("get --force " + Url("f") + " " + fDir.Path("f"));
+  EXPECT_EQ(run.exitCode, kNotWritten);
+  EXPECT_THAT(run.output, EndsWith(": " + lock + " is not a regular file\n"));
+  EXPECT_TRUE(fs::is_fifo(lock));
+}
+
+unsigned ModeOf(std::string const& file) { return static_cast<unsigned>(fs::status(file).permissions()); }
+
+TEST_F(ZepTransferTest, ADownloadKeepsTheModeOfTheFileThatItReplaces) {
+  WriteFile(Remote("f"), "new");
+  std::string const file = Local("f", "old"), command = "get --force " + Url("f") + " " + file;
+  for (unsigned const mode : {0600u, 0640u, 0664u}) {
+    fs::permissions(file, static_cast<fs::perms>(mode));
+    ASSERT_EQ(Zep(command).exitCode, kComplete);
+    EXPECT_EQ(ModeOf(file), mode);
+  }
+  fs::remove(file);
+  ASSERT_EQ(RunProgram("umask 027; NETRC= HOME=/nowhere " + kZep + "get --quiet " + Url("f") + " " + file).exitCode, kComplete);
+  EXPECT_EQ(ModeOf(file), 0640u) << "a new file has the mode that the umask allows";
+}
+
+TEST_F(ZepTransferTest, OnlyTheOwnerMayReadAPart) {
+  WriteFile(Remote("big"), std::string(3000000, 'x'));
+  TServer const relay("relay.py", {"--ftp", "--control", "0", fServer->Port(), "100000"});
+  std::string const file = Private("f", "old"), part = Local("f.part", "of old");
+  fs::permissions(part, static_cast<fs::perms>(0644));
+  ASSERT_EQ(Zep("get --force " + fServer->UrlAt(relay.Port(), "big") + " " + file).exitCode, kNothing);
+  EXPECT_GT(fs::file_size(part), 6u);
+  EXPECT_EQ(ModeOf(part), 0600u);
+}
+
+// Whether the disk is full is tried only with the part itself.
+TEST_F(ZepTransferTest, ALinkInPlaceOfThePartIsNotFollowed) {
+  WriteFile(Remote("big"), std::string(30000000, 'x'));
+  TServer relay("relay.py", {"--ftp", "--how", "stall", "0", fServer->Port(), "100000"});
+  std::string const part = fDir.Path("f.part");
+  TProgramRun run{"", -1};
+  std::thread running([&] { run = Zep("get " + fServer->UrlAt(relay.Port(), "big") + " " + fDir.Path("f")); });
+  std::error_code absent;
+  for (int tries = 0; tries < 2000 && fs::file_size(part, absent) + 1 <= 1; ++tries) ::usleep(5000);  // 0 or, when absent, -1
+  fs::create_symlink("/dev/full", fDir.Path("link"));
+  fs::rename(fDir.Path("link"), part);
+  relay.Stop();
+  running.join();
+  EXPECT_EQ(run.exitCode, kNothing) << run.output;
+  EXPECT_THAT(run.output, Not(HasSubstr("No space left on device")));
 }
 
 // Makes an empty file as soon as one of that name in the directory is deleted.

@@ -360,9 +360,10 @@ private:
     fIsOther = fStart > 0 && !IsPartOf(size);
     if (fIsOther) return false;
     int const how = fStart > 0 ? O_APPEND : fIsThere ? O_CREAT | O_TRUNC : O_CREAT | O_EXCL;
-    fFile = TDescriptor(::open(fPath.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC | how, 0666));
+    fFile = TDescriptor(::open(fPath.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC | how, kModeOfPart));
     if (!fFile) fError = errno;
     if (!fFile) return false;
+    ::fchmod(fFile.Get(), kModeOfPart);  // of an earlier part; a file system without modes refuses it
     if (fStart == 0) WriteNote(fPath, NoteFor(fShownUrl, size));
     fState.fRemoteTime = fConnection.RemoteTime();  // only now is it the time of what the part holds
     return true;

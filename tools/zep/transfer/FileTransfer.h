@@ -5,6 +5,7 @@
 #include "tools/zep/transfer/Remote.h"
 
 #include <sys/mman.h>
+#include <sys/types.h>
 
 #include <atomic>
 #include <cstdint>
@@ -12,6 +13,9 @@
 #include <string>
 
 namespace NQRVZEP20::zep {
+
+// A part of a download is for its owner only: the file that it will replace may be private.
+constexpr mode_t kModeOfPart = 0600;
 
 // Bits of TTransferState::fLeft.
 enum ELeft : unsigned {

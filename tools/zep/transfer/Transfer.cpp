@@ -198,15 +198,16 @@ void ExplainUpload(TTransferred& transferred, TRemote const& place, TUploadNames
 
 // ---- Fetching ----
 
-// A file that only one process at a time can have open so, and that is gone when it is done. One that a killed process left
-// is no hindrance.
+// A file that only one process at a time can have locked, and that is removed at the end. One that a killed process left is used
+// again. A file with content was not made by zep: it stays.
 class TLockFile {
 public:
   explicit TLockFile(std::string path) : fPath(std::move(path)) {
     while (Open() && !IsStillThere()) Close();  // the one that had it has just removed it
   }
   ~TLockFile() {
-    if (fFile) ::unlink(fPath.c_str());
+    struct stat held {};
+    if (fFile && ::fstat(fFile.Get(), &held) == 0 && held.st_size == 0) ::unlink(fPath.c_str());
   }
   TLockFile(TLockFile const&) = delete;
   TLockFile& operator=(TLockFile const&) = delete;
@@ -215,9 +216,14 @@ public:
 
 private:
   bool Open() {
-    fFile = TDescriptor(::open(fPath.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0666));
-    if (fFile && ::flock(fFile.Get(), LOCK_EX | LOCK_NB) == 0) return true;
-    fWhyNotHad = errno == EWOULDBLOCK ? "another transfer into the file goes on" : ReasonOf(errno);
+    fFile = TDescriptor(::open(fPath.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC, 0666));
+    struct stat opened {};
+    bool const isRegular = fFile && ::fstat(fFile.Get(), &opened) == 0 && S_ISREG(opened.st_mode);
+    if (isRegular && ::flock(fFile.Get(), LOCK_EX | LOCK_NB) == 0) return true;
+    if (fFile && !isRegular)
+      fWhyNotHad = Printable(fPath) + " is not a regular file";
+    else
+      fWhyNotHad = errno == EWOULDBLOCK ? "another transfer into the file goes on" : ReasonOf(errno);
     Close();
     return false;
   }
@@ -240,14 +246,30 @@ bool Rename(std::string const& from, std::string const& to, bool overwrites) {
 }
 
 bool MakeEmptyFile(std::string const& path) {
-  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL, 0666));
+  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, kModeOfPart));
   return static_cast<bool>(file);
 }
 
-// Whether more could be written to the file. False, with errno set, on a full disk.
+// The mode of the file that is replaced, or else the one that the umask allows to a new file.
+mode_t ModeFor(std::string const& file) {
+  struct stat replaced {};
+  if (::stat(file.c_str(), &replaced) == 0) return replaced.st_mode & 0777;
+  mode_t const mask = ::umask(0);
+  ::umask(mask);
+  return 0666 & ~mask;
+}
+
+// Where that fails the file keeps its mode: kModeOfPart, or the one that every file of a file system without modes has.
+void SetMode(std::string const& path, mode_t mode) {
+  TDescriptor const file(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_CLOEXEC));
+  if (file) ::fchmod(file.Get(), mode);
+}
+
+// Whether more could be written to the part. False, with errno set, on a full disk. A part that is missing, or that is a
+// symbolic link by now, reveals nothing about the disk.
 bool CanGrow(std::string const& path) {
-  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_APPEND));
-  if (!file) return errno == ENOENT;
+  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_APPEND | O_NOFOLLOW | O_CLOEXEC));
+  if (!file) return errno == ENOENT || errno == ELOOP;
   struct stat before {};
   ::fstat(file.Get(), &before);
   off_t const size = ::lseek(file.Get(), 0, SEEK_END);
@@ -312,6 +334,7 @@ TTransferred Completed(TTransferred transferred, std::string const& file, bool o
   if (!fs::exists(part) && !MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
   transferred.fBytes = fs::file_size(part);
   transferred.fSha256 = Sha256Of(part);
+  SetMode(part, ModeFor(file));
   if (!Rename(part, file, overwrites))
     return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + ReasonOf(errno));
   RemoveNote(part);
