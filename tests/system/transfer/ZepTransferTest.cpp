@@ -56,6 +56,8 @@ std::vector<std::string> NamesIn(std::string const& directory) {
   return names;
 }
 
+unsigned ModeOf(std::string const& file) { return static_cast<unsigned>(fs::status(file).permissions()); }
+
 bool IsThereSoon(std::string const& file) {
   for (int tries = 0; tries < 2000 && !fs::exists(file); ++tries) ::usleep(5000);
   return fs::exists(file);
@@ -539,6 +541,75 @@ TEST(ZepRenameTest, WhatTheServerDoesNotRemoveIsNamed) {
   }
 }
 
+TEST(ZepRenameTest, ADirectoryIsNotReplacedByAFile) {
+  constexpr uid_t kNobody = 65534;
+  TTempDir const dir;
+  WriteFile(dir.Path("f"), "text");
+  for (std::string const protocol : {"ftp", "sftp"}) {
+    std::string const why = WhyNoServer(protocol + ".sh");
+    NEEDS(why.empty(), why);
+    TFileServer const server(protocol);
+    TServedTree const& tree = server.Tree();
+    fs::create_directories(tree.Path("d/uploads"));
+    WriteFile(tree.Path("d/uploads/a"), "precious");
+    fs::create_directory_symlink("uploads", tree.Path("d/link"));
+    for (std::string const name : {"uploads", "link"}) {
+      SCOPED_TRACE(protocol + " " + name);
+      EXPECT_EQ(::chown(tree.Path("d").c_str(), name == "link" ? 0 : kNobody, 0), 0);  // who may write there; root by SFTP
+      TProgramRun const run = Zep("send " + dir.Path("f") + " " + server.Url("d/" + name));
+      EXPECT_EQ(run.exitCode, kNothing);
+      EXPECT_THAT(run.output, EndsWith(": " + name + " is a directory; end the URL with \"/\"\n")) << server.Log();
+    }
+    EXPECT_EQ(NamesIn(tree.Path("d")), (std::vector<std::string>{"link", "uploads"}));
+    EXPECT_EQ(NamesIn(tree.Path("d/uploads")), std::vector<std::string>{"a"});
+    EXPECT_EQ(ReadFile(tree.Path("d/uploads/a")), "precious");
+    EXPECT_TRUE(fs::is_symlink(tree.Path("d/link")));
+  }
+}
+
+TEST(ZepRenameTest, OverSftpTheModeOfAReplacedFileStays) {
+  std::string const why = WhyNoServer("sftp.sh");
+  NEEDS(why.empty(), why);
+  TFileServer const server("sftp");
+  TTempDir const dir;
+  WriteFile(dir.Path("f"), "new");
+  std::string const d = server.Tree().Path("d");
+  fs::create_directory(d);
+  WriteFile(d + "/a secret", "old");
+  WriteFile(d + "/secret", "old");
+  WriteFile(d + "/v1", "version 1");
+  fs::create_symlink("v1", d + "/latest");
+  fs::permissions(d + "/a secret", static_cast<fs::perms>(0644));
+  for (unsigned const mode : {0600u, 0750u}) {
+    fs::permissions(d + "/secret", static_cast<fs::perms>(mode));
+    TProgramRun const run = Zep("send " + dir.Path("f") + " " + server.Url("d/secret"));
+    EXPECT_EQ(run.exitCode, kComplete) << run.output;
+    EXPECT_EQ(ModeOf(d + "/secret"), mode);
+    EXPECT_EQ(ReadFile(d + "/secret"), "new");
+  }
+  // A link is replaced itself.
+  EXPECT_EQ(Zep("send " + dir.Path("f") + " " + server.Url("d/latest")).exitCode, kComplete);
+  EXPECT_FALSE(fs::is_symlink(d + "/latest"));
+  EXPECT_EQ(ModeOf(d + "/latest"), 0644u);
+  EXPECT_EQ(ReadFile(d + "/latest"), "new");
+  EXPECT_EQ(ReadFile(d + "/v1"), "version 1");
+  EXPECT_EQ(NamesIn(d), (std::vector<std::string>{"a secret", "latest", "secret", "v1"}));
+}
+
+// A server that does not rename onto a file; the relay withholds from it the last renaming, which gives the new file its name.
+TEST_F(ZepTransferTest, AnInterruptBetweenTheRenamingsGivesTheFormerFileItsNameAgain) {
+  TFileServer const server("ftp", {{"EXTRA_CONFIG", "<Directory />\nAllowOverwrite off\n</Directory>"}});
+  WriteFile(server.Tree().Path("f"), "old");
+  TServer const relay("relay.py", {"--ftp", "--hold", "2", "RNTO f\r", "0", server.Port(), "100000"});
+  std::string const file = Local("f", "new"), tree = server.Tree().Path();
+  auto const isMovedAway = [&] { return !fs::exists(tree + "/f") && NamesIn(tree).size() == 2; };
+  TInterrupted const sent = InterruptedZep("send " + file + " " + server.UrlAt(relay.Port(), "f"), fDir, isMovedAway, SIGINT);
+  EXPECT_EQ(sent.signal, SIGINT);
+  EXPECT_THAT(sent.output, EndsWith(": interrupted\n")) << server.Log();
+  EXPECT_EQ(NamesIn(tree), std::vector<std::string>{"f"});
+  EXPECT_EQ(ReadFile(tree + "/f"), "old");
+}
+
 // The one who waits for it is another user than root, and cannot look at the process that has the password.
 TEST_F(ZepTransferTest, AUserWithoutPrivilegesSeesHowAnUploadMoves) {
   TFileServer const server("ftp", {{"EXTRA_CONFIG", "TransferRate STOR 5000"}});  // KiB a second
@@ -634,8 +705,6 @@ TEST_F(ZepTransferTest, AForeignFileWithTheNameOfALockStays) {
   EXPECT_THAT(run.output, EndsWith(": " + lock + " is not a regular file\n"));
   EXPECT_TRUE(fs::is_fifo(lock));
 }
-
-unsigned ModeOf(std::string const& file) { return static_cast<unsigned>(fs::status(file).permissions()); }
 
 TEST_F(ZepTransferTest, ADownloadKeepsTheModeOfTheFileThatItReplaces) {
   WriteFile(Remote("f"), "new");

@@ -47,8 +47,11 @@ TRun AddSendArguments(CLI::App& command) {
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
       "Missing directories are made on the server. The file is sent under its name with a number and \".part\" after it, and is\n"
-      "renamed when all has arrived; a file of that name is then replaced. Where the server refuses that, the file is sent to\n"
-      "its place itself. A host gets the file in the directory of the user, or, when ZEP_ISBOOTABLE is \"yes\", in\n"
+      "renamed when all has arrived; a file or link of that name is then replaced by a new file, a directory never. The new "
+      "file\n"
+      "has the mode of the replaced one where an SFTP server reports it, else the mode that the server gives to new files.\n"
+      "Where the server refuses to rename, the file is sent to its place itself. A host gets the file in the directory of the "
+      "user, or, when ZEP_ISBOOTABLE is \"yes\", in\n"
       "hostline/toqrv/vantor/fdr_upload.\n" +
       TransferHelp() + " 2 when the file changed while it was sent.");
   return [arguments] { return Send(*arguments); };

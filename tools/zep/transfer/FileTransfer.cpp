@@ -18,6 +18,7 @@
 #include <cstdio>
 #include <cstring>
 #include <random>
+#include <sstream>
 #include <vector>
 
 namespace NQRVZEP20::zep {
@@ -156,6 +157,35 @@ std::string QuotedForSftp(std::string const& path) {
   return quoted + "\"";
 }
 
+// The mode of the file in a listing such as "-rw-r-----    1 u  g  4 Nov 22 04:00 name", which most SFTP servers send; -1 when
+// the listing does not have it, or when it is not a regular file.
+int ModeInListing(std::string const& listing, std::string const& name) {
+  constexpr int kFieldsBeforeName = 8;
+  std::istringstream lines(listing);
+  for (std::string line; std::getline(lines, line);) {
+    std::size_t at = 0;
+    for (int n = 0; n < kFieldsBeforeName && at != line.npos; ++n) at = line.find(' ', line.find_first_not_of(' ', at));
+    if (at == line.npos || line.substr(at + 1) != name || line.size() < 10 || line[0] != '-') continue;
+    int mode = 0;
+    for (char const c : line.substr(1, 9)) mode = mode * 2 + (std::strchr("rwxst", c) != nullptr ? 1 : 0);
+    return mode;
+  }
+  return -1;
+}
+
+// libcurl's write callback for a text; one of more than 16 MiB is given up.
+std::size_t AppendText(char const* bytes, std::size_t size, std::size_t count, void* context) {
+  constexpr std::size_t kMostBytes = 16 << 20;
+  std::string& text = *static_cast<std::string*>(context);
+  std::size_t const length = size * count;
+  if (text.size() + length > kMostBytes) return length + 1;
+  text.append(bytes, length);
+  return length;
+}
+
+// libcurl's write callback for a transfer that ends with the first bytes that arrive.
+std::size_t EndTransfer(char const*, std::size_t size, std::size_t count, void*) { return size * count + 1; }
+
 // A place on the server, and the names beside it, as the server's commands have them.
 class TNames {
 public:
@@ -165,6 +195,7 @@ public:
 
   std::string const& Name() const { return fName; }
   std::string Url() const { return UrlOf(fPlace); }
+  std::string UrlAsDirectory() const { return Url() + "/"; }
   std::string DirectoryUrl() const { return UrlOf(fDirectory); }
   std::string UrlOfOther(std::string const& name) const { return UrlOf(Beside(fPlace, name)); }
 
@@ -173,9 +204,15 @@ public:
     return {"RNFR " + from, "RNTO " + to};
   }
   TCommands Removal(std::string const& name) const { return {IsSftp() ? "rm " + SftpPath(name) : "DELE " + name}; }
+  // Of SFTP only. A refusal does not count.
+  std::string ChangeOfMode(std::string const& name, int mode) const {
+    char octal[16];
+    std::snprintf(octal, sizeof octal, "%03o", static_cast<unsigned>(mode));
+    return "*chmod " + std::string(octal) + " " + SftpPath(name);
+  }
+  bool IsSftp() const { return fPlace.fScheme == "sftp"; }
 
 private:
-  bool IsSftp() const { return fPlace.fScheme == "sftp"; }
   // FTP commands are about the directory that libcurl has changed to; SFTP's need the path.
   std::string SftpPath(std::string const& name) const {
     std::string const path = "/" + Decoded(fDirectory.fPath) + name;
@@ -200,15 +237,18 @@ public:
     CURLcode const code = Send(fNames.UrlOfOther(temporary), fNames.Renaming(temporary, fNames.Name()), kLeftTemporary);
     if (code == CURLE_OK) return SetLeft(kLeftTemporary, false);
     if (code == CURLE_QUOTE_ERROR) return RenameOrSendAnew();
-    if (!IsNothingWritten(code)) GiveUp(code);
+    if (!IsNothingWritten(code)) GiveUp(code, fConnection.ErrorText());
     SetLeft(kLeftTemporary, false);
     SendToThePlace();
   }
 
-  // What is at the place is spared where nothing of this upload arrived: it may be the file that was there before.
+  // A file at the place is spared when no byte of this upload has been sent to it: it may be the former one. An upload that
+  // ended between its two renamings left nothing at the place: the former file gets its name again.
   void RemoveParts() {
-    if (fState.fLeft & kLeftTemporary) Remove(fOthers.fTemporary, kLeftTemporary);
+    bool const isNotComplete = fState.fLeft & (kLeftTemporary | kLeftAtPlace);
     if ((fState.fLeft & kLeftAtPlace) && fState.fMoved > 0) Remove(fNames.Name(), kLeftAtPlace);
+    if ((fState.fLeft & kLeftFormer) && isNotComplete) RestoreFormer();
+    if (fState.fLeft & kLeftTemporary) Remove(fOthers.fTemporary, kLeftTemporary);
   }
 
 private:
@@ -244,31 +284,69 @@ private:
     return fConnection.Perform(url);
   }
 
-  CURLcode Command(TCommands const& commands) {
+  // Sets the connection up for a short transfer that is no upload.
+  void Prepare(bool hasBody, TCommands const& commandsAfter) {
     fConnection.Set(CURLOPT_UPLOAD, 0L);
-    fConnection.Set(CURLOPT_NOBODY, 1L);
+    fConnection.Set(CURLOPT_NOBODY, hasBody ? 0L : 1L);
     fConnection.Set(CURLOPT_TIMEOUT, static_cast<long>(fCleanUpSeconds));
     fConnection.Set(CURLOPT_PREREQFUNCTION, static_cast<curl_prereq_callback>(nullptr));
-    fConnection.SetCommandsAfter(commands);
+    fConnection.SetCommandsAfter(commandsAfter);
+  }
+
+  CURLcode Command(TCommands const& commands) {
+    Prepare(false, commands);
     return fConnection.Perform(fNames.DirectoryUrl());
+  }
+
+  // Whether the server can change into the place (FTP), or open it as a directory (SFTP).
+  bool IsDirectory() {
+    Prepare(fNames.IsSftp(), {});
+    fConnection.Set(CURLOPT_WRITEFUNCTION, &EndTransfer);
+    fConnection.Set(CURLOPT_FTP_CREATE_MISSING_DIRS, 0L);
+    CURLcode const code = fConnection.Perform(fNames.UrlAsDirectory());
+    fConnection.Set(CURLOPT_FTP_CREATE_MISSING_DIRS, 1L);
+    return code == CURLE_OK || code == CURLE_WRITE_ERROR;
+  }
+
+  [[noreturn]] void FailForDirectory() {
+    RemoveParts();
+    Fail(kZEPStatusAccessDenied, fNames.Name() + " is a directory; end the URL with \"/\"");
+  }
+
+  // The mode of the regular file at the place; -1 when the server does not report it. FTP servers do not.
+  int ModeOfPlace() {
+    if (!fNames.IsSftp()) return -1;
+    std::string listing;
+    Prepare(true, {});
+    fConnection.Set(CURLOPT_WRITEFUNCTION, &AppendText);
+    fConnection.Set(CURLOPT_WRITEDATA, &listing);
+    return fConnection.Perform(fNames.DirectoryUrl()) == CURLE_OK ? ModeInListing(listing, fNames.Name()) : -1;
   }
 
   void Remove(std::string const& name, ELeft what) {
     if (Command(fNames.Removal(name)) == CURLE_OK) SetLeft(what, false);
   }
 
+  void RestoreFormer() {
+    if (Command(fNames.Renaming(fOthers.fFormer, fNames.Name())) == CURLE_OK) SetLeft(kLeftFormer, false);
+  }
+
   // The file has arrived, but did not get its name. Some servers do not rename onto another file: that is moved out of the way.
   void RenameOrSendAnew() {
+    if (IsDirectory()) FailForDirectory();
     std::string const &name = fNames.Name(), &temporary = fOthers.fTemporary, &former = fOthers.fFormer;
+    int const mode = ModeOfPlace();
     SetLeft(kLeftFormer, true);
     CURLcode const moved = Command(fNames.Renaming(name, former));
     if (moved == CURLE_QUOTE_ERROR) SetLeft(kLeftFormer, false);  // refused
     if (moved == CURLE_OK) {
-      if (Command(fNames.Renaming(temporary, name)) == CURLE_OK) {
+      TCommands commands = fNames.Renaming(temporary, name);
+      if (mode >= 0) commands.insert(commands.begin(), fNames.ChangeOfMode(temporary, mode));
+      if (Command(commands) == CURLE_OK) {
         SetLeft(kLeftTemporary, false);
         return Remove(former, kLeftFormer);
       }
-      if (Command(fNames.Renaming(former, name)) == CURLE_OK) SetLeft(kLeftFormer, false);
+      RestoreFormer();
     }
     Remove(temporary, kLeftTemporary);
     fState.fMoved = 0;
@@ -277,14 +355,16 @@ private:
 
   void SendToThePlace() {
     CURLcode const code = Send(fNames.Url(), {}, kLeftAtPlace);
-    if (code == CURLE_OK || IsNothingWritten(code)) SetLeft(kLeftAtPlace, false);
-    if (code != CURLE_OK) GiveUp(code);
+    bool const isRefused = IsNothingWritten(code);
+    if (code == CURLE_OK || isRefused) SetLeft(kLeftAtPlace, false);
+    std::string const reason = fConnection.ErrorText();
+    if (isRefused && IsDirectory()) FailForDirectory();
+    if (code != CURLE_OK) GiveUp(code, reason);
     if (fState.fLeft & kLeftFormer) Remove(fOthers.fFormer, kLeftFormer);
   }
 
   // Removes what may have arrived, and fails.
-  [[noreturn]] void GiveUp(CURLcode code) {
-    std::string const reason = fConnection.ErrorText();
+  [[noreturn]] void GiveUp(CURLcode code, std::string const& reason) {
     RemoveParts();
     TConnection::FailFor(code, reason);
   }
