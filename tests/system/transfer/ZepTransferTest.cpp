@@ -633,6 +633,29 @@ TEST_F(ZepTransferTest, ANetrcThatEveryUserMayReadIsWarnedOf) {
   EXPECT_EQ(Zep(command).output, "");
 }
 
+// Root can read every file, so that a directory stands for one that cannot be read.
+TEST_F(ZepTransferTest, ANetrcThatCannotBeReadIsNotPassedOverInSilence) {
+  std::string const file = Local("f", "text"), url = " ftp://zep@127.0.0.1:" + fServer->Port() + "/f";
+  std::string const line = "machine 127.0.0.1 login zep password secret\n";
+  std::string const tooLong = Private("long", line + std::string(1 << 20, '#')), directory = fDir.Path("directory");
+  std::string const longest = Private("longest", line + std::string((1 << 20) - line.size(), '#'));
+  fs::create_directory(directory);
+  EXPECT_EQ(Zep("send --quiet --netrc " + longest + " " + file + url).output, "");
+  struct TRow {
+    std::string netrc, reason;
+  };
+  for (TRow const& row : {TRow{tooLong, "it is longer than 1 MiB"}, TRow{directory, "Is a directory"}}) {
+    SCOPED_TRACE(row.reason);
+    TProgramRun const refused = Zep("send --netrc " + row.netrc + " " + file + url);
+    EXPECT_EQ(refused.exitCode, kUsage);
+    EXPECT_EQ(refused.output, "zep: " + row.netrc + ": " + row.reason + "\n");
+    TProgramRun const warned = RunProgram("NETRC=" + row.netrc + " " + kZep + "send " + file + url + " < /dev/null 2>&1");
+    EXPECT_EQ(warned.exitCode, kNothing);
+    EXPECT_THAT(warned.output, testing::StartsWith("zep: warning: " + row.netrc +
+                                                   " cannot be read, and no login is taken from it: " + row.reason + "\n"));
+  }
+}
+
 TEST_F(ZepTransferTest, AStandstillEnds) {
   WriteFile(Remote("big"), std::string(30000000, 'x'));
   TServer const relay("relay.py", {"--ftp", "--how", "stall", "0", fServer->Port(), "100000"});

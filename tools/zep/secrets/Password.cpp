@@ -29,7 +29,7 @@ constexpr char const* kVariable = "ZEP_BMC_PASSWORD";
 TSecret PasswordIn(std::string const& path) {
   TPrivateFile const file(path);
   std::string const name = NameOfPrivateFile(path, "--password-file");
-  if (file.Error() != 0) throw std::runtime_error(name + " cannot be read: " + std::strerror(file.Error()));
+  if (file.Error() != 0) throw std::runtime_error(name + " cannot be read: " + file.Reason());
   if (file.Text().empty()) throw std::runtime_error("there is no password in " + name);
   file.WarnWhenOthersMayRead();
   std::string_view line = file.Text().substr(0, file.Text().find('\n'));

@@ -11,6 +11,7 @@
 #include <cstdio>
 #include <iostream>
 #include <set>
+#include <system_error>
 
 namespace NQRVZEP20::zep {
 
@@ -32,14 +33,22 @@ TPrivateFile::TPrivateFile(std::string const& path) : fPath(path) {
   if (file && ::fstat(file.Get(), &status) == 0) fMode = status.st_mode;
   TSecretBytes chunk(4096);
   ssize_t got = file ? 1 : -1;
-  while (got > 0 && fText.size() < kMostBytes) {
+  while (got > 0 && fText.size() <= kMostBytes) {
     got = ::read(file.Get(), chunk.data(), chunk.size());
     if (got < 0 && errno == EINTR)
       got = 1;
     else if (got > 0)
       fText.insert(fText.end(), chunk.begin(), chunk.begin() + got);
   }
-  if (got < 0) fError = errno;
+  if (got < 0)
+    fError = errno;
+  else if (fText.size() > kMostBytes)
+    fError = EFBIG;
+  if (fError != 0) fText = {};
+}
+
+std::string TPrivateFile::Reason() const {
+  return fError == EFBIG ? "it is longer than " + ExactSizeText(kMostBytes) : std::generic_category().message(fError);
 }
 
 void TPrivateFile::WarnWhenOthersMayRead() const {

@@ -13,11 +13,12 @@ namespace NQRVZEP20::zep {
 // A file with passwords, read whole into memory that is overwritten at the end.
 class TPrivateFile {
 public:
-  // Reads at most 1 MiB. What cannot be read leaves the text empty, with the reason in Error().
+  // A file that cannot be read to its end, or is longer than 1 MiB, leaves the text empty, with the reason in Error().
   explicit TPrivateFile(std::string const& path);
 
   std::string_view Text() const { return {fText.data(), fText.size()}; }
-  int Error() const { return fError; }  // errno; 0 when it was read
+  int Error() const { return fError; }  // errno; EFBIG for a file that is too long, 0 when it was read
+  std::string Reason() const;           // the same in words
 
   // A warning on standard error, once for a path, when it is a regular file that every user may read.
   void WarnWhenOthersMayRead() const;

@@ -12,8 +12,8 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstdlib>
+#include <iostream>
 #include <string_view>
-#include <system_error>
 
 namespace NQRVZEP20::zep {
 
@@ -128,8 +128,19 @@ TLogin LoginIn(std::string_view netrc, TRemote const& remote) {
   return {};
 }
 
+// Throws TWrongUsage when the file of --netrc cannot be read; warns of another one. Without ~/.netrc there is no login.
+void CheckNetrc(TPrivateFile const& file, std::string const& path, bool isOption) {
+  if (file.Error() == 0) return;
+  if (isOption) throw TWrongUsage(NameOfPrivateFile(path, "--netrc") + ": " + file.Reason());
+  if (file.Error() == ENOENT) return;
+  std::cerr << "zep: warning: " << Printable(path) << " cannot be read, and no login is taken from it: " << file.Reason() << "\n";
+}
+
+// `netrcFile`: that of --netrc, or empty.
 TLogin LoginOf(TRemote const& remote, std::string const& netrcFile) {
-  TPrivateFile const file(netrcFile);
+  std::string const path = netrcFile.empty() ? DefaultNetrc() : netrcFile;
+  TPrivateFile const file(path);
+  CheckNetrc(file, path, !netrcFile.empty());
   TLogin login = LoginIn(file.Text(), remote);
   if (!login.fPassword.IsEmpty()) file.WarnWhenOthersMayRead();
   return login;
@@ -171,9 +182,7 @@ std::string ShownUrlOf(TRemote const& remote) {
 
 void FindPassword(TRemote& remote, std::string const& netrcFile) {
   if (!remote.fPassword.IsEmpty()) return;
-  if (!netrcFile.empty() && ::access(netrcFile.c_str(), R_OK) != 0)
-    throw TWrongUsage(NameOfPrivateFile(netrcFile, "--netrc") + ": " + std::generic_category().message(errno));
-  TLogin const login = LoginOf(remote, netrcFile.empty() ? DefaultNetrc() : netrcFile);
+  TLogin const login = LoginOf(remote, netrcFile);
   if (remote.fUser.empty()) remote.fUser = login.fUser;
   remote.fPassword = login.fPassword;
   if (remote.fPassword.IsEmpty() && !remote.fUser.empty() && ::isatty(STDIN_FILENO))

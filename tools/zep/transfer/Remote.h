@@ -38,7 +38,7 @@ std::string ShownUrlOf(TRemote const& remote);
 
 // Fills in the user and the password that are missing: from the netrc file (when empty, the one that NETRC names, else
 // ~/.netrc), and the password else by asking for it when standard input is a terminal. What is not found stays empty. Throws
-// TWrongUsage when the file named cannot be read.
+// TWrongUsage when the file named cannot be read to its end, or is longer than 1 MiB; the other files cause a warning then.
 void FindPassword(TRemote& remote, std::string const& netrcFile);
 
 }  // namespace NQRVZEP20::zep
