@@ -7,24 +7,24 @@
 
 namespace NQRVZEP20 {
 
-// MOF, the DMTF's text form of schemas and instances. docs/formats.md tells what is read and written.
+// MOF, the DMTF's text form of schemas and instances. docs/formats.md describes the syntax that is read and written.
 
-// Declares what the file and the files that it includes declare: qualifiers, classes, instances. Files are looked for
-// beside the one that includes them, and must lie in the folder of the first file or below it. A class comes after its
-// superclass; everything else may come in any order.
+// Reads a file and the files that it includes, and declares their qualifiers, classes and instances in the namespace. The path
+// of an included file is relative to the directory of the including one, and must be in the directory of the first file or below
+// it. A class must come after its superclass; otherwise the order does not matter.
 //
-// Throws TMofError, which names the place; also for what the namespace refuses. A file that is wrong in form changes
-// nothing; when the namespace refuses something, what was declared before stays.
+// Throws TMofError, which has the position, also when the namespace refuses a declaration. A syntax error leaves the namespace
+// unchanged; when the namespace refuses a declaration, the earlier ones remain.
 void ReadMofFile(std::string const& path, boost::shared_ptr<ICIMNamespace> ns);
 
-// The same with a text; `name` stands for it in errors. A text includes nothing.
+// The same for a text, which `name` denotes in errors. A text cannot include files.
 void ReadMofText(std::string const& text, std::string const& name, boost::shared_ptr<ICIMNamespace> ns);
 
-// The whole namespace: qualifier declarations, plain classes, associations, instances, each in the order of the
-// enumerations. ReadMofText makes an equal namespace of it, and a copy of the namespace has the same text. Throws
-// kZEPStatusNotSupported for what MOF cannot say: references to no class, arrays of references as properties, numbers
-// that are not finite, datetimes of more than 25 characters, NULL characters, a static value that its class does not
-// declare or that has a default besides.
+// The complete namespace as MOF: qualifier declarations, plain classes, associations, instances, each in the order of the
+// enumerations. ReadMofText makes an equal namespace from it, and a copy of the namespace has the same text. Throws
+// kZEPStatusNotSupported for everything that MOF cannot express: references without a class, arrays of references as properties,
+// numbers that are not finite, datetimes of more than 25 characters, NULL characters, and a static value whose class does not
+// declare it or whose property also has a default.
 std::string WriteMof(ICIMNamespace const& ns);
 
 // One class, without instances.

@@ -17,7 +17,7 @@ std::string NewLine(std::size_t indent) { return "\n" + std::string(indent, ' ')
 
 bool IsInsideCharacter(char c) { return (static_cast<unsigned char>(c) & 0xc0) == 0x80; }
 
-// Where the next piece of the text ends: behind its last blank or line end that fits, or else where it is full.
+// The end of the next piece of the text: after its last blank or line end that fits, or else at the full width.
 std::size_t EndOfPiece(std::string const& text, std::size_t start, std::size_t width) {
   std::size_t end = std::min(start + width, text.size());
   while (end > start && Escaped(std::string_view(text).substr(start, end - start)).size() > width) --end;
@@ -29,8 +29,8 @@ std::size_t EndOfPiece(std::string const& text, std::size_t start, std::size_t w
 }
 
 std::string StringText(std::string const& text, std::size_t column, std::size_t indent) {
-  std::string const whole = "\"" + Escaped(text) + "\"";
-  if (column + whole.size() <= kWidth) return whole;
+  std::string const literal = "\"" + Escaped(text) + "\"";
+  if (column + literal.size() <= kWidth) return literal;
   std::size_t const width = kWidth - std::min<std::size_t>(indent + 2, 60);
   std::string pieces;
   for (std::size_t start = 0; start < text.size();) {
@@ -43,7 +43,7 @@ std::string StringText(std::string const& text, std::size_t column, std::size_t 
 
 }  // namespace
 
-// An item of several lines begins one of its own, and so does what follows it.
+// An item of several lines begins on a line of its own, and so does the item after it.
 std::string MofList(std::vector<std::string> const& items, std::size_t column, std::size_t indent) {
   std::string list;
   bool wasBroken = false;

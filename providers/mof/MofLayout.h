@@ -8,13 +8,13 @@
 
 namespace NQRVZEP20 {
 
-// How MOF is broken into lines of about 100 characters.
+// Breaks MOF into lines of about 100 characters.
 
-// Items between commas: in one line behind `column` characters if they fit, else in lines that begin with `indent` blanks.
+// Items separated by commas: on one line, after `column` characters, if they fit; otherwise on lines indented by `indent` blanks.
 std::string MofList(std::vector<std::string> const& items, std::size_t column, std::size_t indent);
 
-// A value that stands behind `column` characters of its line. A long string becomes several, and a long array lines, which
-// begin with `indent` blanks.
+// A value that follows `column` characters of its line. A long string is split into several strings and a long array into
+// several lines, which are indented by `indent` blanks.
 std::string MofValueText(TCIMValue const& value, std::size_t column, std::size_t indent);
 
 }  // namespace NQRVZEP20

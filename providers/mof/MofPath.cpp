@@ -19,7 +19,7 @@ namespace {
 
 TCIMContext const kNone;
 
-// The keys of a path, one after another.
+// Reads the keys of a path.
 class TKeyReader {
 public:
   TKeyReader(std::string keys, boost::shared_ptr<ICIMNamespace> ns)
@@ -54,19 +54,19 @@ private:
     bool const isQuoted = token.fKind == TMofToken::kString;
     if (isQuoted && type >= TCIMValue::TCIMType::kCIMTypeString) {
       literal.fKind = TMofLiteral::kString;
-      AppendUnescaped(literal.fString, literal.fPlace);
+      AppendUnescaped(literal.fString, literal.fSpan);
     } else if (token.fKind == TMofToken::kChar)
       literal.fKind = TMofLiteral::kChar;
-    else {  // a word or a number, which may stand in quotes
-      if (isQuoted) literal.fPlace.fText = token.fText.substr(1, token.fText.size() - 2);
-      std::string_view const word = literal.fPlace.fText;
+    else {  // a word or a number, with or without quotes
+      if (isQuoted) literal.fSpan.fText = token.fText.substr(1, token.fText.size() - 2);
+      std::string_view const word = literal.fSpan.fText;
       literal.fKind = IsSameName(word, "true") || IsSameName(word, "false") ? TMofLiteral::kBoolean : TMofLiteral::kNumber;
       if (word.empty()) Refuse(token);
     }
-    return {literal.fPlace, false, {literal}};
+    return {literal.fSpan, false, {literal}};
   }
 
-  [[noreturn]] void Refuse(TMofToken const& token) const { throw TMofError({&fKeys, token.fText}, "this is no key of a path"); }
+  [[noreturn]] void Refuse(TMofToken const& token) const { throw TMofError({&fKeys, token.fText}, "not a key of a path"); }
 
   TMofFile const fKeys;
   TMofLexer fLexer;
@@ -74,7 +74,7 @@ private:
 };
 
 TCIMValue Read(std::string const& text, boost::shared_ptr<ICIMNamespace> ns) {
-  std::size_t const start = text.rfind(':', text.find('=')) + 1;  // 0 when there is none
+  std::size_t const start = text.rfind(':', text.find('=')) + 1;  // 0 without ":"
   std::size_t const dot = text.find('.', start);
   TCIMReference path(ns, kNone);
   path.SetClassName(text.substr(start, dot == text.npos ? dot : dot - start));
@@ -84,11 +84,11 @@ TCIMValue Read(std::string const& text, boost::shared_ptr<ICIMNamespace> ns) {
 
 }  // namespace
 
-TCIMValue ReadMofPath(std::string const& path, TMofPlace const& place, boost::shared_ptr<ICIMNamespace> ns) {
+TCIMValue ReadMofPath(std::string const& path, TMofSpan const& span, boost::shared_ptr<ICIMNamespace> ns) {
   try {
     return Read(path, ns);
   } catch (TZEPException const&) {
-    throw TMofError(place, "expected the path of an object whose class is declared, such as \"X_Disk.Id=5\"",
+    throw TMofError(span, "expected the path of an object whose class is declared, such as \"X_Disk.Id=5\"",
                     kZEPStatusInvalidReference);
   }
 }

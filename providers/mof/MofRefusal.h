@@ -7,18 +7,18 @@
 
 namespace NQRVZEP20 {
 
-// Does one step with a namespace. What it refuses becomes an error at that place; a status that is expected gets words of
-// its own.
+// Runs one step on a namespace. An exception of the namespace becomes a TMofError at `span`: the name there and `words` for the
+// status `expected`, the name of the status otherwise.
 template <class TStep>
-auto AtPlace(TMofPlace const& place, EZEPStatusCode expected, char const* words, TStep const& step) {
+auto StepAt(TMofSpan const& span, EZEPStatusCode expected, char const* words, TStep const& step) {
   try {
     return step();
   } catch (TMofError const&) {
     throw;
   } catch (TZEPException const& reason) {
     EZEPStatusCode const status = reason.GetStatusCode().GetCode();
-    std::string const name = NameAt(place);
-    throw TMofError(place, status == expected ? name + " " + words : name + " is refused: " + reason.what(), status);
+    std::string const name = TextAt(span);
+    throw TMofError(span, status == expected ? name + " " + words : name + " is refused: " + reason.what(), status);
   }
 }
 

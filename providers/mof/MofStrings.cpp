@@ -30,25 +30,24 @@ void AppendUtf8(std::string& text, unsigned int code) {
   }
 }
 
-// The code that the escape at the start of `rest`, a backslash, stands for; takes it off. `place` is the literal.
-unsigned int TakeEscape(std::string_view& rest, TMofPlace const& place) {
+// Removes the escape sequence at the start of `rest` and returns its code. `span`: the literal.
+unsigned int TakeEscape(std::string_view& rest, TMofSpan const& span) {
   std::string_view const start = rest;
   rest.remove_prefix(2);  // the lexer leaves no backslash at the end
   if (start[1] == 'x' || start[1] == 'X') {
     unsigned int code = 0;
     char const* const end = rest.data() + std::min<std::size_t>(rest.size(), 4);
     char const* const stop = std::from_chars(rest.data(), end, code, 16).ptr;
-    if (stop == rest.data()) throw TMofError({place.fFile, start}, "expected one to four hexadecimal digits behind \"\\x\"");
+    if (stop == rest.data()) throw TMofError({span.fFile, start}, "expected one to four hexadecimal digits after \"\\x\"");
     rest.remove_prefix(static_cast<std::size_t>(stop - rest.data()));
     return code;
   }
   std::size_t const escape = kEscapes.find(start[1]);
-  if (escape == kEscapes.npos) throw TMofError({place.fFile, start}, "this escape is unknown");
+  if (escape == kEscapes.npos) throw TMofError({span.fFile, start}, "unknown escape sequence");
   return static_cast<unsigned char>(kEscaped[escape]);
 }
 
-// The code of the UTF-8 character of one to three bytes at the start of `rest`, which it takes off; above 0xffff for anything
-// else.
+// Removes the UTF-8 character of one to three bytes at the start of `rest` and returns its code; above 0xffff for anything else.
 unsigned int TakeCharacter(std::string_view& rest) {
   auto const byte = [&rest](std::size_t at) { return static_cast<unsigned char>(rest[at]); };
   std::size_t const size = byte(0) < 0x80 ? 1 : byte(0) < 0xe0 ? 2 : 3;
@@ -69,7 +68,7 @@ std::string HexadecimalEscape(unsigned int code) {
 
 }  // namespace
 
-void AppendUnescaped(std::string& text, TMofPlace const& literal) {
+void AppendUnescaped(std::string& text, TMofSpan const& literal) {
   std::string_view rest = WithoutQuotes(literal.fText);
   text.reserve(text.size() + rest.size());
   for (std::size_t backslash; (backslash = rest.find('\\')) != rest.npos;) {
@@ -77,13 +76,13 @@ void AppendUnescaped(std::string& text, TMofPlace const& literal) {
     rest.remove_prefix(backslash);
     std::string_view const escape = rest;
     unsigned int const code = TakeEscape(rest, literal);
-    if (IsSurrogate(code)) throw TMofError({literal.fFile, escape}, "half of a surrogate pair is no character");
+    if (IsSurrogate(code)) throw TMofError({literal.fFile, escape}, "half of a surrogate pair is not a character");
     AppendUtf8(text, code);
   }
   text.append(rest);
 }
 
-unsigned short CharacterOf(TMofPlace const& literal) {
+unsigned short CharacterOf(TMofSpan const& literal) {
   std::string_view rest = WithoutQuotes(literal.fText);
   unsigned int code = 0x10000;
   if (!rest.empty()) code = rest.front() == '\\' ? TakeEscape(rest, literal) : TakeCharacter(rest);

@@ -12,41 +12,41 @@
 
 namespace NQRVZEP20 {
 
-// A MOF text as it is written: what the parser makes and the builder declares. Names are parts of the files, which the
-// document owns. Classes and instances, of which there may be very many, are not kept: the document knows where each stands,
-// and they are read again when they are declared, one after another.
+// The syntax tree of MOF, which the parser makes and the builder declares. Names are views of the files, which the document
+// owns. The trees of classes and instances are not kept, because there may be very many: the document stores their positions,
+// and each is parsed again when it is declared.
 
 struct TMofLiteral {
   enum EKind { kNull, kBoolean, kNumber, kString, kChar, kAlias };
 
   EKind fKind;
-  TMofPlace fPlace;
+  TMofSpan fSpan;
   std::string fString;  // of kString: joined, without quotes and escapes
 };
 
 struct TMofValue {
-  TMofPlace fPlace;
+  TMofSpan fSpan;
   bool fIsArray = false;
   std::vector<TMofLiteral> fLiterals;  // one unless it is an array
 };
 
 struct TMofQualifier {
-  TMofPlace fName;
+  TMofSpan fName;
   std::optional<TMofValue> fValue;
   std::optional<unsigned int> fFlavor;
 };
 
 using TMofQualifiers = std::vector<TMofQualifier>;
 
-// A type with the array mark that stands behind the name of what has it.
+// A type, with the array mark that follows the name of the element.
 struct TMofType {
   TCIMValue::TCIMType fType = TCIMValue::TCIMType::kCIMTypeInvalid;  // with the array flag
   unsigned int fMaxArraySize = 0;
-  TMofPlace fReferencedClass;  // of references
+  TMofSpan fReferencedClass;  // of references
 };
 
 struct TMofQualifierDecl {
-  TMofPlace fName;
+  TMofSpan fName;
   TMofType fType;
   std::optional<TMofValue> fValue;
   unsigned int fScope = 0;
@@ -56,7 +56,7 @@ struct TMofQualifierDecl {
 struct TMofParameter {
   TMofQualifiers fQualifiers;
   TMofType fType;
-  TMofPlace fName;
+  TMofSpan fName;
 };
 
 // A property, or a method when it has parentheses.
@@ -68,36 +68,36 @@ struct TMofFeature : TMofParameter {
 
 struct TMofClass {
   TMofQualifiers fQualifiers;
-  TMofPlace fName;
-  TMofPlace fSuperClass;  // empty text when there is none
+  TMofSpan fName;
+  TMofSpan fSuperClass;  // with an empty text when there is none
   std::vector<TMofFeature> fFeatures;
 };
 
 struct TMofAssignment {
-  TMofPlace fName;
+  TMofSpan fName;
   TMofValue fValue;
 };
 
 struct TMofInstance {
-  TMofPlace fClassName;
-  TMofPlace fAlias;  // empty text when there is none
+  TMofSpan fClassName;
+  TMofSpan fAlias;  // with an empty text when there is none
   std::vector<TMofAssignment> fValues;
 };
 
-// Where a class stands.
+// The position of a class.
 struct TMofClassText {
   TMofFile const* fFile;
   char const* fStart;    // of its qualifiers
   char const* fKeyword;  // "class"
 };
 
-// Where an instance stands.
+// The position of an instance.
 struct TMofInstanceText {
   TMofFile const* fFile;
   char const* fKeyword;  // "instance"
 };
 
-// The form of everything in it is right.
+// The syntax of everything in it has been checked.
 struct TMofDocument {
   std::vector<std::unique_ptr<TMofFile>> fFiles;
   std::vector<TMofQualifierDecl> fQualifierDecls;

@@ -13,21 +13,21 @@ namespace {
 using TType = TCIMValue::TCIMType;
 
 [[noreturn]] void Refuse(TMofLiteral const& literal, TType type) {
-  throw TMofError(literal.fPlace, "expected a value of the type " + type.ToString());
+  throw TMofError(literal.fSpan, "expected a value of the type " + type.ToString());
 }
 
 TCIMDateTime DateTimeOf(TMofLiteral const& literal) {
   try {
     return TCIMDateTime(literal.fString);
   } catch (TZEPException const&) {
-    throw TMofError(literal.fPlace, "expected a datetime of 25 characters, such as \"20070315143000.000000+060\"");
+    throw TMofError(literal.fSpan, "expected a datetime of 25 characters, such as \"20070315143000.000000+060\"");
   }
 }
 
 TCIMValue StringValue(TMofLiteral const& literal, TType type, boost::shared_ptr<ICIMNamespace> ns) {
   if (type == TType::kCIMTypeString) return TCIMValue(literal.fString);
   if (type == TType::kCIMTypeDateTime) return TCIMValue(DateTimeOf(literal));
-  if (type == TType::kCIMTypeReference) return ReadMofPath(literal.fString, literal.fPlace, ns);
+  if (type == TType::kCIMTypeReference) return ReadMofPath(literal.fString, literal.fSpan, ns);
   Refuse(literal, type);
 }
 
@@ -38,15 +38,15 @@ TCIMValue ScalarValue(TMofLiteral const& literal, TType type, boost::shared_ptr<
     case TMofLiteral::kString:
       return StringValue(literal, type, ns);
     case TMofLiteral::kNumber:
-      return ReadMofNumber(literal.fPlace.fText, type, literal.fPlace);
+      return ReadMofNumber(literal.fSpan.fText, type, literal.fSpan);
     case TMofLiteral::kBoolean:
       if (type != TType::kCIMTypeBoolean) break;
-      return TCIMValue(literal.fPlace.fText.size() == 4);  // "true"
+      return TCIMValue(literal.fSpan.fText.size() == 4);  // "true"
     case TMofLiteral::kChar:
       if (type != TType::kCIMTypeChar16) break;
-      return TCIMValue(TCIMChar16(CharacterOf(literal.fPlace)));
+      return TCIMValue(TCIMChar16(CharacterOf(literal.fSpan)));
     case TMofLiteral::kAlias:
-      throw TMofError(literal.fPlace, "an alias may stand only as the value of a reference of an instance");
+      throw TMofError(literal.fSpan, "an alias is allowed only as the value of a reference in an instance");
   }
   Refuse(literal, type);
 }
@@ -60,7 +60,7 @@ std::string CharacterText(TCIMValue const& value) {
   }
 }
 
-// A value that holds a NULL datetime is NULL to the reader.
+// A NULL datetime within a value that is not NULL is written as NULL.
 std::string DateTimeText(TCIMDateTime const& datetime) {
   if (datetime.IsNull()) return "NULL";
   std::string const text = datetime.ToString();
@@ -75,8 +75,8 @@ void ThrowUnprintable() { throw TZEPException(kZEPStatusNotSupported); }
 TCIMValue ReadMofValue(TMofValue const& value, TType type, unsigned int maxArraySize, boost::shared_ptr<ICIMNamespace> ns) {
   bool const isNull = !value.fIsArray && value.fLiterals.front().fKind == TMofLiteral::kNull;
   if (isNull) return TCIMValue(type, IsArrayType(type) ? maxArraySize : 0);
-  if (value.fIsArray && !IsArrayType(type)) throw TMofError(value.fPlace, "expected one value, not an array of them");
-  if (!value.fIsArray && IsArrayType(type)) throw TMofError(value.fPlace, "expected an array of values in braces");
+  if (value.fIsArray && !IsArrayType(type)) throw TMofError(value.fSpan, "expected one value, not an array");
+  if (!value.fIsArray && IsArrayType(type)) throw TMofError(value.fSpan, "expected an array of values in braces");
   if (!value.fIsArray) return ScalarValue(value.fLiterals.front(), type, ns);
 
   std::vector<TCIMValue> elements;

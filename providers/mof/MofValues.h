@@ -8,22 +8,22 @@
 
 namespace NQRVZEP20 {
 
-// Values as MOF writes them.
+// The values of MOF.
 
-// For what MOF cannot say: kZEPStatusNotSupported.
+// Throws kZEPStatusNotSupported, for a value that MOF cannot express.
 [[noreturn]] void ThrowUnprintable();
 
-// The literal, or the array of them, as a value of that type. References are object paths in strings, in `ns`. Throws
-// TMofError for what is not of the type or does not fit it.
+// The literal, or the array of literals, as a value of that type. A reference is an object path in a string; its class must be in
+// `ns`. Throws TMofError for a literal of another type, or one that does not fit.
 TCIMValue ReadMofValue(TMofValue const& value, TCIMValue::TCIMType type, unsigned int maxArraySize,
                        boost::shared_ptr<ICIMNamespace> ns);
 
-// A scalar, as one literal in one line; NULL too. Throws kZEPStatusNotSupported for what has no literal.
+// A scalar or NULL as one literal, on one line. Throws kZEPStatusNotSupported for a value without a literal.
 std::string MofScalarText(TCIMValue const& value);
 
-// An object path as DSP0004 writes it: `X_Disk.Id=5,Name="a\"b"`. Keys are numbers, words or quoted strings; a key that is
-// a reference is a quoted path. What stands before the class, up to a ":", is dropped. `place` is where errors point.
-TCIMValue ReadMofPath(std::string const& path, TMofPlace const& place, boost::shared_ptr<ICIMNamespace> ns);
+// An object path in the form of DSP0004: `X_Disk.Id=5,Name="a\"b"`. Keys are numbers, words or quoted strings; a key that is a
+// reference is a quoted path. The text before the class, up to a ":", is ignored. Throws TMofError at `span`.
+TCIMValue ReadMofPath(std::string const& path, TMofSpan const& span, boost::shared_ptr<ICIMNamespace> ns);
 std::string MofPathText(TCIMReference const& path);
 
 }  // namespace NQRVZEP20

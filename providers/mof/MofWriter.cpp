@@ -22,7 +22,7 @@ TCIMContext const kNone;
 
 bool IsPlain(boost::shared_ptr<ICIMClass> const& cls) { return !cls->GetClassFlag(kNone); }
 
-// Plain ones first: that is the order in which a copy makes them.
+// Plain classes first, which is the order in which a copy creates them.
 TClasses RootClassesOf(ICIMNamespace const& ns) {
   TClasses roots;
   ns.EnumerateClasses(TAddToVectorCallback<ICIMClass>(roots), kNone);
@@ -30,7 +30,7 @@ TClasses RootClassesOf(ICIMNamespace const& ns) {
   return roots;
 }
 
-// The direct subclasses of each class, plain ones first, by the name of the class.
+// The direct subclasses of each class by its name, plain ones first.
 std::map<std::string, TClasses> SubClassesOf(TClasses const& roots) {
   std::map<std::string, TClasses> subClasses;
   for (auto const& root : roots)
@@ -44,11 +44,11 @@ std::map<std::string, TClasses> SubClassesOf(TClasses const& roots) {
   return subClasses;
 }
 
-// Plain classes first and then associations, each below its superclass: what is referred to is above.
+// Plain classes, then associations, each after its superclass: a class that is referred to comes first.
 TClasses InWrittenOrder(TClasses const& roots) {
   std::map<std::string, TClasses> const subClasses = SubClassesOf(roots);
   TClasses all;
-  TClasses pending(roots.rbegin(), roots.rend());  // the next one last
+  TClasses pending(roots.rbegin(), roots.rend());  // a stack: the next class is the last
   while (!pending.empty()) {
     all.push_back(pending.back());
     pending.pop_back();

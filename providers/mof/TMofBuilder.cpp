@@ -39,17 +39,17 @@ void TMofBuilder::Build() {
 void TMofBuilder::DeclareQualifier(TMofQualifierDecl const& decl) {
   TCIMValue value(decl.fType.fType, decl.fType.fMaxArraySize);
   if (decl.fValue) value = ReadMofValue(*decl.fValue, decl.fType.fType, decl.fType.fMaxArraySize, fNamespace);
-  AtPlace(decl.fName, kZEPStatusAlreadyExists, "is declared already",
-          [&] { fNamespace->CreateQualifierDecl(NameAt(decl.fName), value, decl.fScope, decl.fFlavor, kNone); });
+  StepAt(decl.fName, kZEPStatusAlreadyExists, "is already declared",
+          [&] { fNamespace->CreateQualifierDecl(TextAt(decl.fName), value, decl.fScope, decl.fFlavor, kNone); });
 }
 
 boost::shared_ptr<ICIMClass> TMofBuilder::CreateClass(TMofClass const& cls) {
   boost::shared_ptr<ICIMClass> superClass;
   if (!cls.fSuperClass.fText.empty())
-    superClass = AtPlace(cls.fSuperClass, kZEPStatusNotFound, "is the superclass, and is not declared above",
-                         [&] { return fNamespace->GetClass(NameAt(cls.fSuperClass), kNone); });
-  return AtPlace(cls.fName, kZEPStatusAlreadyExists, "is declared already",
-                 [&] { return fNamespace->CreateClass(superClass, NameAt(cls.fName), kNone); });
+    superClass = StepAt(cls.fSuperClass, kZEPStatusNotFound, "is not declared: a superclass must come before its subclasses",
+                         [&] { return fNamespace->GetClass(TextAt(cls.fSuperClass), kNone); });
+  return StepAt(cls.fName, kZEPStatusAlreadyExists, "is already declared",
+                 [&] { return fNamespace->CreateClass(superClass, TextAt(cls.fName), kNone); });
 }
 
 void TMofBuilder::DescribeClass(TMofClass const& cls, ICIMClass& made) {
@@ -63,22 +63,22 @@ void TMofBuilder::AddProperty(TMofFeature const& property, ICIMClass& cls) {
   if (property.fDefault) {
     TCIMValue const written = ReadMofValue(*property.fDefault, property.fType.fType, property.fType.fMaxArraySize, fNamespace);
     if (written.IsReference() && !written.IsNull() && written.GetReferencedClass() != value.GetReferencedClass())
-      throw TMofError(property.fDefault->fPlace, "expected an object of the class itself that the reference refers to");
+      throw TMofError(property.fDefault->fSpan, "expected the path of an object of exactly the class that the reference names");
     TCIMValue& target = HasStatic(property.fQualifiers) ? staticValue : value;
     if (!written.IsNull()) target = TCIMValue(written);
   }
-  auto const made = AtPlace(property.fName, kZEPStatusAlreadyExists, "is declared already in this class",
-                            [&] { return cls.AddPropertyDecl(NameAt(property.fName), value, kNone); });
+  auto const made = StepAt(property.fName, kZEPStatusAlreadyExists, "is already declared in this class",
+                            [&] { return cls.AddPropertyDecl(TextAt(property.fName), value, kNone); });
   AddQualifiers(property.fQualifiers, *made);
   if (!staticValue.IsNull())
-    AtPlace(property.fName, kZEPStatusOK, "", [&] { cls.SetStaticProperty(NameAt(property.fName), staticValue, kNone); });
+    StepAt(property.fName, kZEPStatusOK, "", [&] { cls.SetStaticProperty(TextAt(property.fName), staticValue, kNone); });
 }
 
 void TMofBuilder::AddMethod(TMofFeature const& method, ICIMClass& cls) {
   if (method.fType.fType == TType::kCIMTypeReference || IsArrayType(method.fType.fType))
-    throw TMofError(method.fName, "a method returns neither a reference nor an array");
-  auto const made = AtPlace(method.fName, kZEPStatusAlreadyExists, "is declared already in this class",
-                            [&] { return cls.AddMethodDecl(NameAt(method.fName), method.fType.fType, kNone); });
+    throw TMofError(method.fName, "a method cannot return a reference or an array");
+  auto const made = StepAt(method.fName, kZEPStatusAlreadyExists, "is already declared in this class",
+                            [&] { return cls.AddMethodDecl(TextAt(method.fName), method.fType.fType, kNone); });
   AddQualifiers(method.fQualifiers, *made);
   for (TMofParameter const& parameter : method.fParameters) AddParameter(parameter, *made);
 }
@@ -87,8 +87,8 @@ void TMofBuilder::AddParameter(TMofParameter const& parameter, ICIMMethodDecl& m
   TMofType const& type = parameter.fType;
   std::string className;
   if (BaseTypeOf(type.fType) == TType::kCIMTypeReference) className = FindClass(type.fReferencedClass)->GetName(kNone);
-  auto const made = AtPlace(parameter.fName, kZEPStatusAlreadyExists, "is declared already in this method", [&] {
-    return method.AddParameterDecl(NameAt(parameter.fName), type.fType, type.fMaxArraySize, className, kNone);
+  auto const made = StepAt(parameter.fName, kZEPStatusAlreadyExists, "is already declared in this method", [&] {
+    return method.AddParameterDecl(TextAt(parameter.fName), type.fType, type.fMaxArraySize, className, kNone);
   });
   AddQualifiers(parameter.fQualifiers, *made);
 }
@@ -97,22 +97,22 @@ void TMofBuilder::AddQualifiers(TMofQualifiers const& qualifiers, ICIMNamedEleme
   for (TMofQualifier const& qualifier : qualifiers) {
     TDeclaredQualifier const& declared = Declared(qualifier.fName);
     TCIMValue const value = ValueOf(qualifier, declared);
-    AtPlace(qualifier.fName, kZEPStatusAlreadyExists, "is written twice here",
+    StepAt(qualifier.fName, kZEPStatusAlreadyExists, "is given twice",
             [&] { element.AddQualifier(declared.fDecl, value, qualifier.fFlavor.value_or(declared.fFlavor), kNone); });
   }
 }
 
-// Without a value a boolean is true, and anything else the declared default.
+// A qualifier without value is true if it is boolean; otherwise it has the declared default.
 TCIMValue TMofBuilder::ValueOf(TMofQualifier const& qualifier, TDeclaredQualifier const& declared) const {
   if (qualifier.fValue) return ReadMofValue(*qualifier.fValue, declared.fType, declared.fDefault.GetMaxArraySize(), fNamespace);
   return declared.fType == TType::kCIMTypeBoolean ? TCIMValue(true) : declared.fDefault;
 }
 
-TMofBuilder::TDeclaredQualifier const& TMofBuilder::Declared(TMofPlace const& name) {
+TMofBuilder::TDeclaredQualifier const& TMofBuilder::Declared(TMofSpan const& name) {
   auto const found = fDeclared.find(name.fText);
   if (found != fDeclared.end()) return found->second;
-  auto const decl = AtPlace(name, kZEPStatusNotFound, "is no qualifier that is declared", [&] {
-    boost::shared_ptr<ICIMQualifierDecl> const named = fNamespace->GetQualifierDecl(NameAt(name), kNone);
+  auto const decl = StepAt(name, kZEPStatusNotFound, "is not a declared qualifier", [&] {
+    boost::shared_ptr<ICIMQualifierDecl> const named = fNamespace->GetQualifierDecl(TextAt(name), kNone);
     if (!named) throw TZEPException(kZEPStatusNotFound);
     return named;
   });
@@ -120,12 +120,11 @@ TMofBuilder::TDeclaredQualifier const& TMofBuilder::Declared(TMofPlace const& na
   return fDeclared.emplace(name.fText, declared).first->second;
 }
 
-boost::shared_ptr<ICIMClass> TMofBuilder::FindClass(TMofPlace const& name) const {
-  return AtPlace(name, kZEPStatusNotFound, "is no class that is declared",
-                 [&] { return fNamespace->GetClass(NameAt(name), kNone); });
+boost::shared_ptr<ICIMClass> TMofBuilder::FindClass(TMofSpan const& name) const {
+  return StepAt(name, kZEPStatusNotFound, "is not a declared class", [&] { return fNamespace->GetClass(TextAt(name), kNone); });
 }
 
-// Whether they make the value of a property one of the class.
+// Whether the qualifiers make a property static.
 bool TMofBuilder::HasStatic(TMofQualifiers const& qualifiers) {
   for (TMofQualifier const& qualifier : qualifiers)
     if (IsSameName(qualifier.fName.fText, "Static")) return ValueOf(qualifier, Declared(qualifier.fName)) == TCIMValue(true);

@@ -14,8 +14,8 @@ class ICIMMethodDecl;
 class ICIMNamedElement;
 class ICIMQualifierDecl;
 
-// Declares in a namespace what a document holds. All classes are made before any property is declared, so that references
-// may lead forward. Throws TMofError for what makes no sense and what the namespace refuses.
+// Declares the contents of a document in a namespace. All classes are created before the first property is declared, so that a
+// reference may name a later class. Throws TMofError for a declaration that is wrong, or that the namespace refuses.
 class TMofBuilder {
 public:
   TMofBuilder(TMofDocument const& document, boost::shared_ptr<ICIMNamespace> ns) : fDocument(document), fNamespace(ns) {}
@@ -23,7 +23,7 @@ public:
   void Build();
 
 private:
-  // A qualifier declaration as it is asked for once for each use.
+  // A qualifier declaration, and its properties, which are read from the namespace only once.
   struct TDeclaredQualifier {
     boost::shared_ptr<ICIMQualifierDecl> fDecl;
     TCIMValue::TCIMType fType;
@@ -40,13 +40,13 @@ private:
   void AddQualifiers(TMofQualifiers const& qualifiers, ICIMNamedElement& element);
   TCIMValue ValueOf(TMofQualifier const& qualifier, TDeclaredQualifier const& declared) const;
   bool HasStatic(TMofQualifiers const& qualifiers);
-  TDeclaredQualifier const& Declared(TMofPlace const& name);
-  boost::shared_ptr<ICIMClass> FindClass(TMofPlace const& name) const;
+  TDeclaredQualifier const& Declared(TMofSpan const& name);
+  boost::shared_ptr<ICIMClass> FindClass(TMofSpan const& name) const;
   TCIMValue NullOfProperty(TMofType const& type) const;
 
   TMofDocument const& fDocument;
   boost::shared_ptr<ICIMNamespace> fNamespace;
-  std::unordered_map<std::string_view, TDeclaredQualifier> fDeclared;  // by name, as it is spelled where it is used
+  std::unordered_map<std::string_view, TDeclaredQualifier> fDeclared;  // by name, in the spelling of its use
 };
 
 }  // namespace NQRVZEP20

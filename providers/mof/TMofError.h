@@ -9,27 +9,28 @@
 
 namespace NQRVZEP20 {
 
-// A text that is read, and the name under which errors speak of it.
+// A text, and its name in errors.
 struct TMofFile {
   std::string fName;
   std::string fText;
 };
 
-// A part of a file: what an error speaks of.
-struct TMofPlace {
+// A part of a file, to which an error refers.
+struct TMofSpan {
   TMofFile const* fFile = nullptr;
   std::string_view fText = {};  // of fFile->fText
 };
 
-inline std::string NameAt(TMofPlace const& place) { return std::string(place.fText); }
+inline std::string TextAt(TMofSpan const& span) { return std::string(span.fText); }
 
-// What is wrong with a MOF text, and where: "disks.mof:3:14: expected ";", found "class"". Lines and columns count from 1,
-// columns in bytes. The status is kZEPStatusInvalidFormat, or why a file cannot be read or the namespace refuses.
+// An error in a MOF text, with its position: "disks.mof:3:14: expected ";", found "class"". Lines and columns count from 1,
+// columns in bytes. The status is kZEPStatusInvalidFormat, that of a file that cannot be read, or that with which the namespace
+// refused a declaration.
 class TMofError : public TZEPException {
 public:
-  TMofError(TMofPlace const& place, std::string const& what, EZEPStatusCode status = kZEPStatusInvalidFormat);
+  TMofError(TMofSpan const& span, std::string const& reason, EZEPStatusCode status = kZEPStatusInvalidFormat);
 
-  // For a file that cannot be read at all.
+  // For a file that cannot be read; the message is complete.
   TMofError(std::string const& message, EZEPStatusCode status);
 
   char const* what() const noexcept override { return fMessage->c_str(); }

@@ -17,7 +17,7 @@ namespace NQRVZEP20 {
 
 namespace {
 
-constexpr std::size_t kMostNestedKeys = 8;  // the text of such a path doubles with each
+constexpr std::size_t kMaxKeyDepth = 8;  // the text of a path doubles with each level
 
 TCIMContext const kNone;
 
@@ -36,13 +36,13 @@ void TMofInstances::Build() {
 }
 
 void TMofInstances::Create(TMofInstance const& instance) {
-  auto const cls = AtPlace(instance.fClassName, kZEPStatusNotFound, "is no class that is declared",
-                           [&] { return fNamespace->GetClass(NameAt(instance.fClassName), kNone); });
-  auto const made = AtPlace(instance.fClassName, kZEPStatusInvalidClass, "is abstract and has no instances",
+  auto const cls = StepAt(instance.fClassName, kZEPStatusNotFound, "is not a declared class",
+                           [&] { return fNamespace->GetClass(TextAt(instance.fClassName), kNone); });
+  auto const made = StepAt(instance.fClassName, kZEPStatusInvalidClass, "is abstract and cannot have instances",
                             [&] { return cls->CreateInstance(kNone); });
-  if (!instance.fAlias.fText.empty() && !fAliases.emplace(FoldName(NameAt(instance.fAlias)), fMade.size()).second)
-    throw TMofError(instance.fAlias, NameAt(instance.fAlias) + " is the alias of another instance");
-  fMade.push_back({instance.fClassName, cls, made, kNotSet});
+  if (!instance.fAlias.fText.empty() && !fAliases.emplace(FoldName(TextAt(instance.fAlias)), fCreated.size()).second)
+    throw TMofError(instance.fAlias, TextAt(instance.fAlias) + " is already the alias of another instance");
+  fCreated.push_back({instance.fClassName, cls, made, kNotSet});
 }
 
 void TMofInstances::SetPlainValues(std::size_t number) {
@@ -50,29 +50,29 @@ void TMofInstances::SetPlainValues(std::size_t number) {
   TMofInstance const instance = TMofParser(*text.fFile, text.fKeyword).ParseInstance();
   std::set<std::string> seen;
   for (TMofAssignment const& assignment : instance.fValues) {
-    if (!seen.insert(FoldName(NameAt(assignment.fName))).second)
-      throw TMofError(assignment.fName, NameAt(assignment.fName) + " has a value already");
+    if (!seen.insert(FoldName(TextAt(assignment.fName))).second)
+      throw TMofError(assignment.fName, TextAt(assignment.fName) + " already has a value");
     auto const property = PropertyOf(number, assignment.fName);
     if (IsAlias(assignment.fValue)) {
-      fAliasValues.push_back({number, assignment.fName, assignment.fValue.fPlace});
+      fAliasValues.push_back({number, assignment.fName, assignment.fValue.fSpan});
       continue;
     }
     TCIMValue const pattern = property->GetDeclaration(kNone)->GetDefaultValue(kNone);
     TCIMValue const value = ReadMofValue(assignment.fValue, pattern.GetType(), pattern.GetMaxArraySize(), fNamespace);
-    AtPlace(assignment.fName, kZEPStatusOK, "", [&] { property->SetValue(value, kNone); });
+    StepAt(assignment.fName, kZEPStatusOK, "", [&] { property->SetValue(value, kNone); });
   }
 }
 
 void TMofInstances::SetKeys(std::size_t number) {
-  if (fMade[number].fKeys == kSet) return;
-  fMade[number].fKeys = kBeingSet;
+  if (fCreated[number].fKeys == kSet) return;
+  fCreated[number].fKeys = kBeingSet;
   ++fDepth;
   SetAliases(number, true);
   --fDepth;
-  fMade[number].fKeys = kSet;
+  fCreated[number].fKeys = kSet;
 }
 
-// Those among the keys, or all others.
+// Sets either the keys whose values are aliases, or the other properties.
 void TMofInstances::SetAliases(std::size_t number, bool keys) {
   auto const isBefore = [](TAliasValue const& value, std::size_t wanted) { return value.fNumber < wanted; };
   auto value = std::lower_bound(fAliasValues.begin(), fAliasValues.end(), number, isBefore);
@@ -80,28 +80,29 @@ void TMofInstances::SetAliases(std::size_t number, bool keys) {
     auto const property = PropertyOf(number, value->fName);
     if (property->GetDeclaration(kNone)->IsKey(kNone) != keys) continue;
     TCIMValue const path = PathOf(value->fAlias);
-    AtPlace(value->fName, kZEPStatusTypeMismatch, "is no reference", [&] { property->SetValue(path, kNone); });
+    StepAt(value->fName, kZEPStatusTypeMismatch, "is not a reference", [&] { property->SetValue(path, kNone); });
   }
 }
 
 void TMofInstances::Commit(std::size_t number) {
-  AtPlace(fMade[number].fClassName, kZEPStatusAlreadyExists, "has another instance with the same keys",
-          [&] { fMade[number].fClass->CommitInstance(fMade[number].fInstance, kNone); });
+  StepAt(fCreated[number].fClassName, kZEPStatusAlreadyExists, "already has an instance with the same keys",
+          [&] { fCreated[number].fClass->CommitInstance(fCreated[number].fInstance, kNone); });
 }
 
-boost::shared_ptr<ICIMProperty> TMofInstances::PropertyOf(std::size_t number, TMofPlace const& name) const {
-  auto const property = fMade[number].fInstance->GetProperty(NameAt(name), kNone);
-  if (!property) throw TMofError(name, NameAt(name) + " is no property of the class", kZEPStatusNotFound);
+boost::shared_ptr<ICIMProperty> TMofInstances::PropertyOf(std::size_t number, TMofSpan const& name) const {
+  auto const property = fCreated[number].fInstance->GetProperty(TextAt(name), kNone);
+  if (!property) throw TMofError(name, TextAt(name) + " is not a property of the class", kZEPStatusNotFound);
   return property;
 }
 
-TCIMValue TMofInstances::PathOf(TMofPlace const& alias) {
-  auto const found = fAliases.find(FoldName(NameAt(alias)));
-  if (found == fAliases.end()) throw TMofError(alias, NameAt(alias) + " is the alias of no instance", kZEPStatusNotFound);
-  if (fMade[found->second].fKeys == kBeingSet) throw TMofError(alias, NameAt(alias) + " is needed to tell its own keys");
-  if (fDepth > kMostNestedKeys) throw TMofError(alias, "keys lead from one instance to another more than 8 deep");
+TCIMValue TMofInstances::PathOf(TMofSpan const& alias) {
+  auto const found = fAliases.find(FoldName(TextAt(alias)));
+  if (found == fAliases.end()) throw TMofError(alias, TextAt(alias) + " is not the alias of any instance", kZEPStatusNotFound);
+  if (fCreated[found->second].fKeys == kBeingSet)
+    throw TMofError(alias, "the keys of " + TextAt(alias) + " depend on themselves");
+  if (fDepth > kMaxKeyDepth) throw TMofError(alias, "keys refer from one instance to the next more than 8 levels deep");
   SetKeys(found->second);
-  TCIMReference path = fMade[found->second].fInstance->GetPath(kNone);
+  TCIMReference path = fCreated[found->second].fInstance->GetPath(kNone);
   return TCIMValue(path);
 }
 

@@ -13,8 +13,8 @@ namespace NQRVZEP20 {
 class ICIMInstance;
 class ICIMProperty;
 
-// Makes the instances of a document. An alias may be used before and behind the instance that it stands for, also in
-// circles, as long as no instance is needed to tell its own keys.
+// Creates the instances of a document. An alias may be used before and after its instance, and instances may refer to one
+// another in circles, as long as the keys of no instance depend on themselves.
 class TMofInstances {
 public:
   TMofInstances(TMofDocument const& document, boost::shared_ptr<ICIMNamespace> ns) : fDocument(document), fNamespace(ns) {}
@@ -24,14 +24,14 @@ public:
 private:
   enum EKeys { kNotSet, kBeingSet, kSet };
 
-  // An alias as the value of a property.
+  // A property whose value is an alias.
   struct TAliasValue {
-    std::size_t fNumber;  // of the instance, in fMade
-    TMofPlace fName, fAlias;
+    std::size_t fNumber;  // of the instance, in fCreated
+    TMofSpan fName, fAlias;
   };
 
-  struct TMade {
-    TMofPlace fClassName;
+  struct TCreated {
+    TMofSpan fClassName;
     boost::shared_ptr<ICIMClass> fClass;
     boost::shared_ptr<ICIMInstance> fInstance;
     EKeys fKeys;
@@ -42,14 +42,14 @@ private:
   void SetKeys(std::size_t number);
   void SetAliases(std::size_t number, bool keys);
   void Commit(std::size_t number);
-  boost::shared_ptr<ICIMProperty> PropertyOf(std::size_t number, TMofPlace const& name) const;
-  TCIMValue PathOf(TMofPlace const& alias);
+  boost::shared_ptr<ICIMProperty> PropertyOf(std::size_t number, TMofSpan const& name) const;
+  TCIMValue PathOf(TMofSpan const& alias);
 
   TMofDocument const& fDocument;
   boost::shared_ptr<ICIMNamespace> fNamespace;
-  std::size_t fDepth = 0;                                 // of the keys that are being set
-  std::vector<TMade> fMade;                               // one for each instance of the document
-  std::unordered_map<std::string, std::size_t> fAliases;  // into fMade, by name in small letters
+  std::size_t fDepth = 0;                                 // of nested keys being set
+  std::vector<TCreated> fCreated;                         // one for each instance of the document
+  std::unordered_map<std::string, std::size_t> fAliases;  // indexes of fCreated, by lower-case name
   std::vector<TAliasValue> fAliasValues;                  // in the order of the instances
 };
 

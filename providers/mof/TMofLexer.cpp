@@ -13,7 +13,7 @@ namespace {
 
 enum ECharacter : unsigned char { kOther, kBlank, kLetter, kDigit, kMarkCharacter };
 
-// What each byte is; every byte from 0x80 up counts as a letter, so that UTF-8 passes.
+// The kind of each byte. Every byte from 0x80 up counts as a letter, so that names may contain UTF-8.
 constexpr std::array<ECharacter, 256> MakeCharacters() {
   std::array<ECharacter, 256> kinds{};
   for (int c = 0x80; c < 0x100; ++c) kinds[c] = kLetter;
@@ -51,7 +51,7 @@ TMofToken TMofLexer::Next() {
     char const* const end = EndOfName(fNext + 1);
     if (IsSameName({fNext, static_cast<std::size_t>(end - fNext)}, "#pragma")) return Take(TMofToken::kPragma, end);
   }
-  Refuse(fNext + 1, "this character begins nothing that is known here");
+  Refuse(fNext + 1, "unexpected character");
 }
 
 void TMofLexer::SkipBlanksAndComments() {
@@ -71,9 +71,9 @@ void TMofLexer::SkipComment() {
     fNext += std::min(rest.find('\n'), rest.size());
     return;
   }
-  if (rest.substr(0, 2) != "/*") Refuse(fNext + 1, "this character begins nothing that is known here");
+  if (rest.substr(0, 2) != "/*") Refuse(fNext + 1, "unexpected character");
   std::size_t const end = rest.find("*/", 2);
-  if (end == rest.npos) Refuse(fNext + 2, "this comment has no end");
+  if (end == rest.npos) Refuse(fNext + 2, "this comment is not closed by \"*/\"");
   fNext += end + 2;
 }
 
@@ -88,8 +88,8 @@ TMofToken TMofLexer::TakeQuoted(TMofToken::EKind kind, char quote) {
     if (*at == quote) return Take(kind, at + 1);
     if (*at == '\\' && ++at == fEnd) break;
   }
-  Refuse(fNext + 1, kind == TMofToken::kString ? "this string has no closing quote in its line"
-                                               : "this character has no closing quote in its line");
+  Refuse(fNext + 1, kind == TMofToken::kString ? "this string is not closed on its line"
+                                               : "this character literal is not closed on its line");
 }
 
 char const* TMofLexer::EndOfName(char const* at) const {
@@ -104,14 +104,14 @@ bool TMofLexer::IsNumber() const {
   return at != fEnd && KindOf(*at) == kDigit;
 }
 
-// Takes in whatever could belong to a number; whether it is one is asked when its type is known. A sign goes on with it
-// behind the exponent's "e" only, which in a hexadecimal number is a digit.
+// Takes every character that can be part of a number; the number is checked when its type is known. A sign belongs to it only
+// after the "e" of an exponent, which in a hexadecimal number is a digit.
 char const* TMofLexer::EndOfNumber() const {
   char const* at = fNext + 1;
   bool const isHexadecimal = fEnd - fNext > 2 && std::string_view(fNext, 3).find_first_of("xX") != std::string_view::npos;
   for (; at != fEnd; ++at) {
-    bool const isBehindE = !isHexadecimal && (at[-1] == 'e' || at[-1] == 'E');
-    if (!IsOfName(*at) && *at != '.' && !(isBehindE && (*at == '+' || *at == '-'))) break;
+    bool const isAfterE = !isHexadecimal && (at[-1] == 'e' || at[-1] == 'E');
+    if (!IsOfName(*at) && *at != '.' && !(isAfterE && (*at == '+' || *at == '-'))) break;
   }
   return at;
 }

@@ -10,9 +10,9 @@ namespace NQRVZEP20 {
 struct TMofToken {
   enum EKind {
     kEnd,
-    kName,    // a keyword too: keywords are recognised by where they stand
+    kName,    // or a keyword, which the parser recognises by its position
     kNumber,  // as written, with its sign
-    kString,  // with its quotes and escapes; neighbours are not joined yet
+    kString,  // with its quotes and escapes; adjacent strings are separate tokens
     kChar,    // 'a', with its quotes
     kAlias,   // $Name
     kPragma,  // #pragma
@@ -23,15 +23,15 @@ struct TMofToken {
   std::string_view fText;  // of the file
 };
 
-// Cuts a text into tokens; blanks and comments fall away. Throws TMofError for what is no token.
+// Splits a text into tokens and drops blanks and comments. Throws TMofError for text that is not a token.
 class TMofLexer {
 public:
   explicit TMofLexer(TMofFile const& file) : TMofLexer(file, file.fText.data()) {}
 
-  // From `start` on, which lies in the text.
+  // Starts at `start`, a position in the text.
   TMofLexer(TMofFile const& file, char const* start) : fFile(file), fNext(start), fEnd(file.fText.data() + file.fText.size()) {}
 
-  TMofToken Next();  // at the end of the text kEnd, as often as it is called
+  TMofToken Next();  // at the end of the text, and at each later call: kEnd
 
 private:
   void SkipBlanksAndComments();

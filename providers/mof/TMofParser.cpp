@@ -40,7 +40,7 @@ constexpr TFlavorWord kFlavors[] = {
     {"Translatable", ICIMQualifierDecl::kFlavorTranslatable, 0},
 };
 
-// The types that have a name of their own, all but the reference; tag 0 for any other word.
+// The type of that name, except a reference; tag 0 for any other word.
 TType IntrinsicType(std::string_view word) {
   if (word.size() < 5 || word.size() > 8) return TType::kCIMTypeInvalid;
   TType const type{std::string(word)};
@@ -64,8 +64,7 @@ void TMofParser::ParseFile(TMofDocument& document, TMofSources& sources) {
   }
 }
 
-// Reads it to see whether its form is right, and notes where it stands. An instance has no qualifiers: those before it are
-// dropped.
+// Checks the syntax of the declaration and stores its position. Qualifiers before an instance are dropped.
 void TMofParser::ParseClassOrInstance(TMofDocument& document) {
   char const* const start = fToken.fText.data();
   ParseQualifiers();
@@ -80,12 +79,12 @@ void TMofParser::ParseClassOrInstance(TMofDocument& document) {
     Refuse("\"class\" or \"instance\"");
 }
 
-// An include is read where it stands; every other pragma is passed over.
+// An included file is read at once; any other pragma is ignored.
 void TMofParser::ParsePragma(TMofDocument& document, TMofSources& sources) {
   Advance();
-  TMofPlace const name = ExpectName("the name of a pragma");
+  TMofSpan const name = ExpectName("the name of a pragma");
   Expect('(');
-  TMofPlace const argument = Here();
+  TMofSpan const argument = Here();
   std::string const text = ParseString();
   if (IsSameName(name.fText, "include")) {
     TMofParser(sources.OpenIncluded(text, argument)).ParseFile(document, sources);
@@ -130,8 +129,7 @@ unsigned int TMofParser::ParseScope() {
   return scope;
 }
 
-// Words one after another, in a declaration with commas if it likes. What they do not say is that of a qualifier without
-// flavor.
+// Words; in a declaration, optional commas separate them. A flavor that no word states is that of a qualifier without flavor.
 unsigned int TMofParser::ParseFlavor(bool inDeclaration) {
   unsigned int flavor = ICIMQualifierDecl::kFlavorDefault;
   for (bool isFirst = true;; isFirst = false) {
@@ -167,7 +165,7 @@ TMofClass TMofParser::ParseClassHead() {
   return cls;
 }
 
-// Qualifiers of values are read and dropped, as those of the instance are.
+// Qualifiers of values are dropped, as those of the instance are.
 TMofInstance TMofParser::ParseInstance() {
   TMofInstance instance = ParseInstanceHead();
   Expect('{');
@@ -222,8 +220,8 @@ TMofFeature TMofParser::ParseFeature() {
     if (!Skip(')')) ParseListUpTo(')', [&] { feature.fParameters.push_back(ParseParameter()); });
   } else if (Skip('='))
     feature.fDefault = ParseValue();
-  bool const couldGoOn = !feature.fIsMethod && !feature.fDefault;
-  if (!Skip(';')) Refuse(couldGoOn ? "\"(\", \"=\" or \";\"" : "\";\"");
+  bool const isBareProperty = !feature.fIsMethod && !feature.fDefault;
+  if (!Skip(';')) Refuse(isBareProperty ? "\"(\", \"=\" or \";\"" : "\";\"");
   return feature;
 }
 
@@ -241,7 +239,7 @@ TMofType TMofParser::ParseType() {
   TMofType type;
   type.fReferencedClass = ExpectName("a type, a class and \"REF\", or \"}\"");
   type.fType = TType::kCIMTypeReference;
-  if (!SkipWord("ref")) Refuse("\"REF\" behind what is no type");
+  if (!SkipWord("ref")) Refuse("\"REF\" after \"" + TextAt(type.fReferencedClass) + "\", which is not a type");
   return type;
 }
 
@@ -266,9 +264,9 @@ void TMofParser::ParseArrayMark(TMofType& type) {
   Expect(']');
 }
 
-TMofPlace TMofParser::ParseAlias() {
-  if (!SkipWord("as")) return TMofPlace{&fFile, {}};
-  TMofPlace const alias = Here();
+TMofSpan TMofParser::ParseAlias() {
+  if (!SkipWord("as")) return TMofSpan{&fFile, {}};
+  TMofSpan const alias = Here();
   if (fToken.fKind != TMofToken::kAlias) Refuse("an alias, such as \"$Disk\"");
   Advance();
   return alias;
@@ -277,14 +275,14 @@ TMofPlace TMofParser::ParseAlias() {
 TMofValue TMofParser::ParseValue() {
   if (IsMark('{')) return ParseArray();
   TMofValue value;
-  value.fPlace = Here();
+  value.fSpan = Here();
   value.fLiterals.push_back(ParseLiteral());
   return value;
 }
 
 TMofValue TMofParser::ParseArray() {
   TMofValue value;
-  value.fPlace = Here();
+  value.fSpan = Here();
   value.fIsArray = true;
   Expect('{');
   if (!Skip('}')) ParseListUpTo('}', [&] { value.fLiterals.push_back(ParseLiteral()); });
@@ -317,7 +315,7 @@ TMofLiteral TMofParser::ParseLiteral() {
   return literal;
 }
 
-// Items between commas, and the mark behind the last.
+// Items separated by commas, and the mark after the last one.
 template <class TParseItem>
 void TMofParser::ParseListUpTo(char end, TParseItem const& parseItem) {
   do parseItem();
@@ -325,7 +323,7 @@ void TMofParser::ParseListUpTo(char end, TParseItem const& parseItem) {
   if (!Skip(end)) Refuse(std::string("\",\" or \"") + end + "\"");
 }
 
-// Strings that stand one after another are one.
+// Adjacent strings are one.
 std::string TMofParser::ParseString() {
   if (fToken.fKind != TMofToken::kString) Refuse("a string");
   std::string text;
@@ -353,17 +351,17 @@ void TMofParser::Expect(char mark) {
   if (!Skip(mark)) Refuse(std::string("\"") + mark + "\"");
 }
 
-TMofPlace TMofParser::ExpectName(char const* what) {
+TMofSpan TMofParser::ExpectName(char const* what) {
   if (fToken.fKind != TMofToken::kName) Refuse(what);
-  TMofPlace const name = Here();
+  TMofSpan const name = Here();
   Advance();
   return name;
 }
 
 void TMofParser::Refuse(std::string const& expected) const {
-  constexpr std::size_t kMost = 40;
-  std::string found = fToken.fKind == TMofToken::kEnd ? "the end of the file" : std::string(fToken.fText.substr(0, kMost));
-  if (fToken.fText.size() > kMost) found += "...";
+  constexpr std::size_t kMaxShown = 40;
+  std::string found = fToken.fKind == TMofToken::kEnd ? "the end of the file" : std::string(fToken.fText.substr(0, kMaxShown));
+  if (fToken.fText.size() > kMaxShown) found += "...";
   if (fToken.fKind == TMofToken::kMark || fToken.fKind == TMofToken::kName) found = "\"" + found + "\"";
   throw TMofError(Here(), "expected " + expected + ", found " + found);
 }

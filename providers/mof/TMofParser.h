@@ -10,20 +10,20 @@
 
 namespace NQRVZEP20 {
 
-// Reads MOF: its form only, not whether it makes sense. Throws TMofError, which tells what was expected.
+// Reads the syntax of MOF; the builder checks the meaning. Throws TMofError, whose message names the expected text.
 class TMofParser {
 public:
   explicit TMofParser(TMofFile const& file) : TMofParser(file, file.fText.data()) {}
-  TMofParser(TMofFile const& file, char const* start);  // begins there in the text
+  TMofParser(TMofFile const& file, char const* start);  // `start`: a position in the text of the file
 
-  // The whole file, and those that it includes, into the document.
+  // Reads the complete file, and the files that it includes, into the document.
   void ParseFile(TMofDocument& document, TMofSources& sources);
 
-  // What stands where the parser begins. Without features, or values, these read no further than they have to.
-  TMofClass ParseClass();            // from its qualifiers or from "class"
-  TMofClass ParseClassHead();        // from "class"; without features
-  TMofInstance ParseInstance();      // from "instance"
-  TMofInstance ParseInstanceHead();  // from "instance"; without values
+  // Read one declaration at the start position. The heads end before the features or values.
+  TMofClass ParseClass();            // starts at its qualifiers or at "class"
+  TMofClass ParseClassHead();        // starts at "class"
+  TMofInstance ParseInstance();      // starts at "instance"
+  TMofInstance ParseInstanceHead();  // starts at "instance"
 
 private:
   // ---- Productions ----
@@ -39,7 +39,7 @@ private:
   TMofType ParseType();
   TMofType ParseIntrinsicType();
   void ParseArrayMark(TMofType& type);
-  TMofPlace ParseAlias();
+  TMofSpan ParseAlias();
   TMofValue ParseValue();
   TMofValue ParseArray();
   TMofLiteral ParseLiteral();
@@ -48,14 +48,14 @@ private:
   std::string ParseString();
 
   // ---- Tokens ----
-  TMofPlace Here() const { return {&fFile, fToken.fText}; }
+  TMofSpan Here() const { return {&fFile, fToken.fText}; }
   void Advance() { fToken = fLexer.Next(); }
   bool IsMark(char mark) const { return fToken.fKind == TMofToken::kMark && fToken.fText.front() == mark; }
   bool IsWord(std::string_view word) const;
-  bool Skip(char mark);  // goes on if that mark stands here
+  bool Skip(char mark);  // advances if the token is that mark, and returns whether it was
   bool SkipWord(std::string_view word);
   void Expect(char mark);
-  TMofPlace ExpectName(char const* what);
+  TMofSpan ExpectName(char const* what);
   [[noreturn]] void Refuse(std::string const& expected) const;
 
   TMofFile const& fFile;

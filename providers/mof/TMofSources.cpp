@@ -15,7 +15,7 @@ namespace fs = std::filesystem;
 
 namespace {
 
-constexpr std::size_t kMostOpenFiles = 100;
+constexpr std::size_t kMaxOpenFiles = 100;
 
 std::string ReasonOf(int error) { return std::generic_category().message(error); }
 
@@ -24,7 +24,7 @@ EZEPStatusCode StatusOf(int error) {
   return error == EACCES ? kZEPStatusAccessDenied : kZEPStatusFileSystemError;
 }
 
-// The path without links and dots; empty, with the reason, when there is no such file, or it is no regular one.
+// The canonical path. Empty, with the reason in `error`, when the file is missing or is not a regular file.
 fs::path RegularFile(fs::path const& path, int& error) {
   std::error_code failure;
   fs::path const canonical = fs::canonical(path, failure);
@@ -48,17 +48,17 @@ private:
   int const fFd;
 };
 
-// Reads up to the end of the file, whatever its size is said to be: one that changes meanwhile, or tells no size, is neither
-// cut nor padded. Returns 0, or the error of the system that ended the reading; `text` is of no use then.
-int ReadWhole(fs::path const& path, std::string& text) {
-  constexpr std::size_t kLeast = 4096;
+// Reads to the end of the file, whatever size it reports: a file that changes meanwhile, or has no size, is neither cut nor
+// padded. Returns 0, or the errno of a failure, after which `text` is unspecified.
+int ReadToEnd(fs::path const& path, std::string& text) {
+  constexpr std::size_t kMinBuffer = 4096;
   TOpenFile const file(path);
   if (file.Get() < 0) return errno;
   struct stat status = {};
   if (::fstat(file.Get(), &status) != 0) return errno;
 
-  // One byte more than its size, so that the end is seen without growing.
-  text.resize(std::max(static_cast<std::size_t>(status.st_size) + 1, kLeast));
+  // One byte more than the size, so that the end is found without growing the buffer.
+  text.resize(std::max(static_cast<std::size_t>(status.st_size) + 1, kMinBuffer));
   std::size_t size = 0;
   for (;;) {
     ssize_t const got = ::read(file.Get(), text.data() + size, text.size() - size);
@@ -81,7 +81,7 @@ TMofFile const& TMofSources::OpenFirst(std::string const& path) {
   int error = 0;
   fs::path const canonical = RegularFile(path, error);
   std::string text;
-  if (error == 0) error = ReadWhole(canonical, text);
+  if (error == 0) error = ReadToEnd(canonical, text);
   if (error != 0) throw TMofError(path + ": cannot be read: " + ReasonOf(error), StatusOf(error));
   fFolder = canonical.parent_path();
   fOpen.push_back({canonical, path});
@@ -90,19 +90,19 @@ TMofFile const& TMofSources::OpenFirst(std::string const& path) {
 
 TMofFile const& TMofSources::OpenText(std::string const& text, std::string const& name) { return Add(name, text); }
 
-TMofFile const& TMofSources::OpenIncluded(std::string const& name, TMofPlace const& directive) {
-  if (fFolder.empty()) throw TMofError(directive, "a text that is no file cannot include one");
-  if (fOpen.size() >= kMostOpenFiles) throw TMofError(directive, "files include one another more than 100 deep");
+TMofFile const& TMofSources::OpenIncluded(std::string const& name, TMofSpan const& directive) {
+  if (fFolder.empty()) throw TMofError(directive, "only a file can include another file");
+  if (fOpen.size() >= kMaxOpenFiles) throw TMofError(directive, "files include one another more than 100 levels deep");
 
   int error = 0;
   fs::path const canonical = RegularFile(fOpen.back().fPath.parent_path() / name, error);
   if (error == 0 && !IsWithin(fFolder, canonical))
-    throw TMofError(directive, "the included file lies outside the folder of the first one", kZEPStatusAccessDenied);
-  auto const isIt = [&canonical](TOpen const& open) { return open.fPath == canonical; };
-  if (error == 0 && std::any_of(fOpen.begin(), fOpen.end(), isIt)) throw TMofError(directive, "the file includes itself");
+    throw TMofError(directive, "the included file is outside the directory of the first file", kZEPStatusAccessDenied);
+  auto const isSame = [&canonical](TOpen const& open) { return open.fPath == canonical; };
+  if (error == 0 && std::any_of(fOpen.begin(), fOpen.end(), isSame)) throw TMofError(directive, "the file includes itself");
 
   std::string text;
-  if (error == 0) error = ReadWhole(canonical, text);
+  if (error == 0) error = ReadToEnd(canonical, text);
   if (error != 0) throw TMofError(directive, "the included file cannot be read: " + ReasonOf(error), StatusOf(error));
   fOpen.push_back({canonical, fOpen.back().fName.parent_path() / name});
   return Add(fOpen.back().fName.string(), std::move(text));

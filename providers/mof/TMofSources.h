@@ -9,30 +9,30 @@
 
 namespace NQRVZEP20 {
 
-// The files of one document: reads them, and keeps includes within the folder of the first one.
+// Reads the files of one document. Included files must be in the directory of the first file, or below it.
 class TMofSources {
 public:
   explicit TMofSources(TMofDocument& document) : fDocument(document) {}
 
-  // The file that everything begins with, or a text in its place, which includes nothing.
+  // The first file, or a text instead of a file; a text cannot include files.
   TMofFile const& OpenFirst(std::string const& path);
   TMofFile const& OpenText(std::string const& text, std::string const& name);
 
-  // A file that the last one opened includes. `directive` is its name where it stands.
-  TMofFile const& OpenIncluded(std::string const& name, TMofPlace const& directive);
+  // A file that is included by the file opened last. `directive`: the position of its name, for errors.
+  TMofFile const& OpenIncluded(std::string const& name, TMofSpan const& directive);
   void CloseIncluded() { fOpen.pop_back(); }
 
 private:
   struct TOpen {
-    std::filesystem::path fPath;  // without links and dots
-    std::filesystem::path fName;  // as errors call it
+    std::filesystem::path fPath;  // canonical
+    std::filesystem::path fName;  // for errors
   };
 
   TMofFile const& Add(std::string const& name, std::string text);
 
   TMofDocument& fDocument;
-  std::filesystem::path fFolder;  // empty for a text
-  std::vector<TOpen> fOpen;       // the file that is read, and before it those that include it
+  std::filesystem::path fFolder;  // of the first file; empty for a text
+  std::vector<TOpen> fOpen;       // the file being read is the last; each file includes the next
 };
 
 }  // namespace NQRVZEP20

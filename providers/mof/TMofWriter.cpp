@@ -21,7 +21,7 @@ namespace NQRVZEP20 {
 namespace {
 
 using TType = TCIMValue::TCIMType;
-using TStaticValues = std::map<std::string, TCIMValue>;  // by name in small letters
+using TStaticValues = std::map<std::string, TCIMValue>;  // by lower-case name
 
 TCIMContext const kNone;
 
@@ -50,7 +50,7 @@ std::string ArrayMark(TType type, unsigned int maxArraySize) {
 
 std::string TypeText(TType type, std::string const& referencedClass) {
   if (BaseTypeOf(type) != TType::kCIMTypeReference) return type.ToString();
-  TType const sameName(referencedClass);  // a class that is called as a type would be taken for it
+  TType const sameName(referencedClass);  // a class with the name of a type would be read as the type
   if (referencedClass.empty() || HasTypeName(sameName)) ThrowUnprintable();
   return referencedClass + " REF";
 }
@@ -94,7 +94,7 @@ bool IsStatic(ICIMPropertyDecl const& property) {
   return qualifier && IsTrue(qualifier->GetValue(kNone));
 }
 
-// What stands behind the property's "=": its static value, which is taken out of `statics`, or its default.
+// The initial value of a property: its static value, which is removed from `statics`, or its default.
 TCIMValue TakeInitialValue(ICIMPropertyDecl const& property, TStaticValues& statics) {
   TCIMValue const defaultValue = property.GetDefaultValue(kNone);
   auto const found = statics.find(FoldName(property.GetName(kNone)));

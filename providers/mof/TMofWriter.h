@@ -16,7 +16,7 @@ class ICIMPropertyDecl;
 class ICIMQualifier;
 class ICIMQualifierDecl;
 
-// Writes declarations as MOF, one below the other. Long lists and texts are broken into lines.
+// Writes declarations as MOF, one after another. Long lists and texts are split into lines.
 class TMofWriter {
 public:
   void WriteQualifierDecl(ICIMQualifierDecl const& decl);

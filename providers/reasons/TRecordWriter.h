@@ -21,7 +21,7 @@ class TMemoryNamespace;
 // value becomes an instance of the class ZEP_MissingValue (MissingValueClass.h). TReasonReader reads both.
 //
 // The writer keeps a reference to the namespace. Every operation throws what the namespace throws (TMemoryNamespace.h), such as
-// kZEPStatusAlreadyExists for a class that is declared already. Use it from one thread at a time.
+// kZEPStatusAlreadyExists for a class that is already declared. Use it from one thread at a time.
 class TRecordWriter {
 public:
   // Declares the qualifier ValueSource.

@@ -93,7 +93,7 @@ TEST_F(MofTest, AMistakeIsToldWithItsPlace) {
   EXPECT_EQ(run.errors, "zep: bad.mof:2:9: expected \"REF\" behind what is no type, found \"Name\"\n");
 
   WriteFile(fZep.Path("bad.mof"), "class \x1b[31m");
-  EXPECT_EQ(Run({"mof", "bad.mof"}).errors, "zep: bad.mof:1:7: this character begins nothing that is known here\n");
+  EXPECT_EQ(Run({"mof", "bad.mof"}).errors, "zep: bad.mof:1:7: unexpected character\n");
   EXPECT_EQ(Run({"mof", "none.mof"}).errors, "zep: none.mof: cannot be read: No such file or directory\n");
   EXPECT_EQ(Run({"mof", "none.mof"}).status, 1);
 }
