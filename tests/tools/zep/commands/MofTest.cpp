@@ -90,7 +90,7 @@ TEST_F(MofTest, AMistakeIsToldWithItsPlace) {
   TRun const run = Run({"mof", "bad.mof"});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: bad.mof:2:9: expected \"REF\" behind what is no type, found \"Name\"\n");
+  EXPECT_EQ(run.errors, "zep: bad.mof:2:9: expected \"REF\" after \"strin\", which is not a type, found \"Name\"\n");
 
   WriteFile(fZep.Path("bad.mof"), "class \x1b[31m");
   EXPECT_EQ(Run({"mof", "bad.mof"}).errors, "zep: bad.mof:1:7: unexpected character\n");
