@@ -16,14 +16,14 @@ namespace {
 enum EClockKind { kTimeOfDay = 1, kSinceStart = 2 };
 
 void DescribeClasses(TMemoryNamespace& ns) {
-  ns.DefineClass("X_TimeSource").Abstract().Description("Something that tells the time.").Key("Name", "string");
+  ns.DefineClass("X_TimeSource").Abstract().Description("A source of time.").Key("Name", "string");
 
   ns.DefineClass("X_Clock", "X_TimeSource")
       .Description("A clock of the operating system.")
       .Property("Kind", "uint16")
       .ValueMap({"1", "2"}, {"Time of day", "Time since the start of the machine"})
       .Property("Seconds", "uint64")
-      .Description("What the clock showed when the namespace was filled.")
+      .Description("The time that the clock showed when the namespace was filled.")
       .Property("ResolutionNanoseconds", "uint64");
 
   ns.DefineClass("X_RunsAtTheRateOf")
