@@ -416,17 +416,33 @@ TEST_F(ZepTransferTest, ADownloadHasAGreatestSize) {
               "zep: --max-size takes SIZE, such as 500K, 2M or 1G\n");
 }
 
+TEST_F(ZepTransferTest, ADownloadOfUnknownSizeEndsAtTheGreatestSize) {
+  WriteFile(Remote("big"), std::string(3000000, 'x'));
+  TServer const relay("relay.py", {"--ftp", "--hide-size", "0", fServer->Port(), "1000000000"});
+  std::string const file = fDir.Path("f"), url = fServer->UrlAt(relay.Port(), "big");
+  TProgramRun run = Zep("get --max-size 1M " + url + " " + file);
+  EXPECT_EQ(run.exitCode, kNothing);
+  EXPECT_THAT(run.output, EndsWith(": the file is larger than 1 MiB; --max-size allows more\n"));
+  EXPECT_THAT(fServer->Log(), AllOf(HasSubstr("TYPE I"), Not(HasSubstr("SIZE")))) << "no size was reported";
+  EXPECT_EQ(NamesIn(fDir.Path()), std::vector<std::string>{});
+  run = Zep("get --max-size 3000000 " + url + " " + file);
+  EXPECT_EQ(run.exitCode, kComplete) << run.output;
+  EXPECT_EQ(fs::file_size(file), 3000000u);
+}
+
 // zep as a process that signals are sent to; what it printed, and the signal that ended it.
 struct TInterrupted {
   std::string output;
   int signal;
 };
 
-TInterrupted InterruptedZep(std::string const& arguments, TTempDir const& dir, std::function<bool()> const& isReady, int signal) {
+// With `isReadyAgain` the signal is sent again and again from then on, until zep has ended. `prefix` begins the command.
+TInterrupted InterruptedZep(std::string const& arguments, TTempDir const& dir, std::function<bool()> const& isReady, int signal,
+                            std::function<bool()> const& isReadyAgain = {}, std::string const& prefix = "") {
   std::string const printed = dir.Path("printed");
   pid_t const child = ::fork();
   if (child == 0) {
-    std::string const command = "exec env HOME=/nowhere NETRC= TMPDIR=" + dir.Path("tmp") + " " + kZep + arguments +
+    std::string const command = "exec env HOME=/nowhere NETRC= TMPDIR=" + dir.Path("tmp") + " " + prefix + kZep + arguments +
                                 " < /dev/null > " + printed + " 2>&1";
     ::execl("/bin/sh", "sh", "-c", command.c_str(), nullptr);
     ::_exit(127);
@@ -435,7 +451,16 @@ TInterrupted InterruptedZep(std::string const& arguments, TTempDir const& dir, s
   EXPECT_TRUE(isReady());
   ::kill(child, signal);
   int status = 0;
-  ::waitpid(child, &status, 0);
+  if (isReadyAgain) {
+    for (int tries = 0; tries < 4000 && !isReadyAgain(); ++tries) ::usleep(5000);
+    EXPECT_TRUE(isReadyAgain());
+    for (int tries = 0; tries < 1000 && ::waitpid(child, &status, WNOHANG) == 0; ++tries) {
+      ::kill(child, signal);
+      ::usleep(50000);
+    }
+  } else {
+    ::waitpid(child, &status, 0);
+  }
   return {ReadFile(printed), WIFSIGNALED(status) ? WTERMSIG(status) : 0};
 }
 
@@ -505,6 +530,72 @@ TEST_F(ZepTransferTest, WhatAnInterruptedUploadLeftIsRemovedOrNamed) {
             AllOf(testing::ContainsRegex(": interrupted; the server may have a part of it: " + std::string(kPartUrl) + "\n"),
                   HasSubstr("/" + NamesIn(tree).front() + "\n")));
     }
+}
+
+std::size_t CountOf(std::string const& word, std::string const& text) {
+  std::size_t count = 0;
+  for (std::size_t at = text.find(word); at != text.npos; at = text.find(word, at + 1)) ++count;
+  return count;
+}
+
+// The relay withholds the command that removes the part, so that the server never answers it.
+class ZepCleanUpTest : public ZepTransferTest {
+protected:
+  std::vector<std::string> RelayArguments(std::string const& how) const {
+    return {"--ftp", "--how", how, "--hold", "1", "DELE", "0", fServer->Port(), "100000"};
+  }
+  bool HasPart() const {
+    for (fs::directory_entry const& entry : fs::directory_iterator(fServer->Tree().Path()))
+      if (entry.file_size() > 0) return true;
+    return false;
+  }
+  std::string fFile = Local("f", std::string(30000000, 'x'));
+};
+
+TEST_F(ZepCleanUpTest, TakesTenSecondsAtMostAfterAFailure) {
+  TServer const relay("relay.py", RelayArguments("close"));
+  auto const start = std::chrono::steady_clock::now();
+  TProgramRun const run = Zep("send " + fFile + " " + fServer->UrlAt(relay.Port(), "f"));
+  EXPECT_EQ(run.exitCode, kNothing);
+  EXPECT_THAT(run.output, testing::ContainsRegex("; the server may have a part of it: " + std::string(kPartUrl) + "\n"));
+  EXPECT_GT(SecondsSince(start), 3) << "it waited";
+  EXPECT_LT(SecondsSince(start), 30);
+}
+
+TEST_F(ZepCleanUpTest, TakesFiveSecondsAtMostAfterAnInterruptAndASecondOneEndsIt) {
+  for (bool const isInterruptedAgain : {false, true}) {
+    SCOPED_TRACE(isInterruptedAgain);
+    std::size_t const loginsBefore = CountOf("PASS ", fServer->Log());
+    TServer const relay("relay.py", RelayArguments("stall"));
+    std::chrono::steady_clock::time_point start;
+    auto const isMoving = [&] {
+      start = std::chrono::steady_clock::now();
+      return HasPart();
+    };
+    auto const isCleaningUp = [&] {
+      start = std::chrono::steady_clock::now();
+      return CountOf("PASS ", fServer->Log()) == loginsBefore + 2;
+    };
+    std::function<bool()> const isReadyAgain = isInterruptedAgain ? isCleaningUp : std::function<bool()>();
+    TInterrupted const sent =
+        InterruptedZep("send " + fFile + " " + fServer->UrlAt(relay.Port(), "f"), fDir, isMoving, SIGINT, isReadyAgain);
+    double const seconds = SecondsSince(start);
+    EXPECT_EQ(sent.signal, SIGINT);
+    EXPECT_THAT(sent.output, testing::ContainsRegex(": interrupted; the server may have a part of it: " + std::string(kPartUrl)));
+    EXPECT_GT(seconds, isInterruptedAgain ? 0 : 3.5);
+    EXPECT_LT(seconds, isInterruptedAgain ? 3 : 30);
+    for (std::string const& name : NamesIn(fServer->Tree().Path())) fs::remove(Remote(name));
+  }
+}
+
+TEST_F(ZepTransferTest, UnderNohupATransferSurvivesAHangUp) {
+  TFileServer const server("ftp", {{"EXTRA_CONFIG", "TransferRate RETR 200"}});  // KiB a second
+  WriteFile(server.Tree().Path("f"), std::string(500000, 'x'));
+  std::string const file = fDir.Path("f");
+  TInterrupted const fetched = InterruptedZep(
+      "get " + server.Url("f") + " " + file, fDir, [&] { return fs::exists(file + ".part"); }, SIGHUP, {}, "nohup ");
+  EXPECT_EQ(fetched.signal, 0);
+  EXPECT_THAT(fetched.output, HasSubstr(file + ": 500000 bytes, SHA-256 "));
 }
 
 TEST(ZepRenameTest, WhatTheServerDoesNotRemoveIsNamed) {
@@ -1116,6 +1207,17 @@ TEST(ZepReportTest, IsSentPacked) {
   EXPECT_EQ(nlohmann::json::parse(unpacked)["document"], "zep report");
   fs::remove(dir.Path("printed"));
   EXPECT_TRUE(fs::is_empty(dir.Path())) << "nothing is left";
+}
+
+TEST(ZepReportTest, ItsDocumentNamesWhatIsLeftOnTheServer) {
+  std::string const why = WhyNoServer("ftp.sh");
+  NEEDS(why.empty(), why);
+  TFileServer const server("ftp", {{"EXTRA_CONFIG", "<Limit RNFR RNTO DELE>\nDenyAll\n</Limit>"}});
+  auto const document = nlohmann::json::parse(
+      RunProgram(kZep + "report --sample --json --send " + server.Url("") + " < /dev/null 2> /dev/null").output);
+  ASSERT_EQ(document["sent"]["leftOnServer"].size(), 1u) << document["sent"];
+  std::string const left = document["sent"]["leftOnServer"][0];
+  EXPECT_TRUE(fs::exists(server.Tree().Path(left.substr(left.rfind('/') + 1)))) << left;
 }
 
 TEST(ZepReportTest, IsKeptWhenItCannotBeSent) {

@@ -286,6 +286,18 @@ TEST_F(ZepWpadTest, SaysWhyThereIsNoFile) {
   }
 }
 
+TEST_F(ZepWpadTest, TheFileHasAGreatestSize) {
+  NEEDS(IsCurlThere(), "no libcurl (package libcurl4)");
+  TRun const refused = RunInside("", "$ZEP wpad --no-stop --fetch --max-file 20");
+  EXPECT_EQ(refused.status, 2);
+  EXPECT_EQ(refused.errors, "zep: the file was not fetched: it is larger than 20 bytes; --max-file allows more\n");
+  for (char const* size : {"1K", "0"}) {
+    TRun const fetched = RunInside("", "$ZEP wpad --no-stop --fetch --max-file " + std::string(size));
+    EXPECT_EQ(fetched.status, 0) << fetched.errors;
+    EXPECT_NE(fetched.output.find(kFile), std::string::npos);
+  }
+}
+
 TEST_F(ZepWpadTest, AUrlIsPrintedAsTextAndLosesItsEnd) {
   // "http://a<escape>[2J", a newline and a zero byte
   std::string const reply = ReplyFile(std::string(2 * 240, '0') + "fc0e" + "687474703a2f2f611b5b324a0a00");

@@ -76,7 +76,10 @@ bool IsCutAt(std::string const& file, std::uint64_t mostBytes) {
 void ExplainNoConnection(TOutcome& outcome, TRemote const& proxy) {
   constexpr int kProbeSeconds = 3;
   std::string const why = WhyUnreachable(proxy.fHost, proxy.fPort, kProbeSeconds);
-  if (!why.empty()) outcome.fReason = Printable(why);
+  if (PendingInterrupt() != 0)
+    outcome = Interrupted();
+  else if (!why.empty())
+    outcome.fReason = Printable(why);
 }
 
 // Something may come back from the proxy itself: its refusal, or that it cannot reach the page. So the page has to be the one.

@@ -87,6 +87,7 @@ void AddSending(TJson& document, TSentReport const& sent) {
   document["sent"] = {{"url", OrNull(transferred.fUrl)},
                       {"bytes", isSent ? TJson(transferred.fBytes) : TJson(nullptr)},
                       {"sha256", OrNull(transferred.fSha256)},
+                      {"leftOnServer", transferred.fLeftOnServer},
                       {"keptIn", OrNull(sent.fKeptIn)}};
 }
 

@@ -10,6 +10,7 @@
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/Terminal.h"
 #include "tools/zep/output/Text.h"
+#include "tools/zep/transfer/Transfer.h"
 #include "tools/zep/wpad/DhcpClients.h"
 #include "tools/zep/wpad/PacFile.h"
 #include "tools/zep/wpad/ProxySearch.h"
@@ -31,6 +32,7 @@ struct TArguments {
   bool fIsConfirmed = false;
   bool fKeepsClients = false;
   bool fFetches = false;
+  std::uint64_t fMostBytes = 1 << 20;  // of the file
 };
 
 struct TFindings {
@@ -209,7 +211,7 @@ int Wpad(TArguments const& arguments) {
     throw std::runtime_error("nothing was done; --yes confirms, and --no-stop leaves the DHCP clients alone");
   TFindings findings{Search(), !arguments.fKeepsClients, {}};
   std::string const& url = findings.fSearch.fUrl;
-  if (arguments.fFetches && !url.empty()) findings.fPacFile = FetchPacFile(url);
+  if (arguments.fFetches && !url.empty()) findings.fPacFile = FetchPacFile(url, arguments.fMostBytes);
   Tell(findings, arguments.fAsJson);
   return findings.ExitStatus();
 }
@@ -220,6 +222,8 @@ TRun AddWpadArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.add_flag("--fetch", arguments->fFetches, "Fetch the file too, through plain HTTP by libcurl, and print it");
+  AddSizeOption(command, "--max-file", arguments->fMostBytes,
+                "The most bytes of the file that are fetched (1 MiB), such as 500K or 2M; 0: no limit");
   auto* const yes = command.add_flag("--yes", arguments->fIsConfirmed, "End the DHCP clients without asking");
   command
       .add_flag("--no-stop", arguments->fKeepsClients, "Leave the DHCP clients alone; while one holds port 68, nothing is heard")

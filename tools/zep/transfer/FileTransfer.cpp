@@ -13,8 +13,10 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <array>
 #include <cerrno>
+#include <chrono>
 #include <cstdio>
 #include <cstring>
 #include <random>
@@ -33,6 +35,7 @@ namespace {
 // ---- libcurl ----
 
 using TCommands = std::vector<std::string>;
+using TClock = std::chrono::steady_clock;
 
 // libcurl, and one connection that goes on from one transfer to the next.
 class TConnection {
@@ -245,6 +248,7 @@ public:
   // A file at the place is spared when no byte of this upload has been sent to it: it may be the former one. An upload that
   // ended between its two renamings left nothing at the place: the former file gets its name again.
   void RemoveParts() {
+    fCleanUpEnd = TClock::now() + std::chrono::seconds(fCleanUpSeconds);
     bool const isNotComplete = fState.fLeft & (kLeftTemporary | kLeftAtPlace);
     if ((fState.fLeft & kLeftAtPlace) && fState.fMoved > 0) Remove(fNames.Name(), kLeftAtPlace);
     if ((fState.fLeft & kLeftFormer) && isNotComplete) RestoreFormer();
@@ -276,6 +280,7 @@ private:
     fConnection.Set(CURLOPT_NOBODY, 0L);
     fConnection.Set(CURLOPT_UPLOAD, 1L);
     fConnection.Set(CURLOPT_TIMEOUT, 0L);
+    fConnection.Set(CURLOPT_SERVER_RESPONSE_TIMEOUT, 0L);
     fConnection.Set(CURLOPT_READFUNCTION, &ReadSource);
     fConnection.Set(CURLOPT_READDATA, &source);
     fConnection.Set(CURLOPT_PREREQFUNCTION, &MarkBegun);
@@ -284,16 +289,25 @@ private:
     return fConnection.Perform(url);
   }
 
-  // Sets the connection up for a short transfer that is no upload.
+  // The whole seconds that a command may take.
+  long SecondsLeft() const {
+    std::chrono::seconds const most(fCleanUpSeconds);
+    return std::chrono::ceil<std::chrono::seconds>(std::min<TClock::duration>(most, fCleanUpEnd - TClock::now())).count();
+  }
+
+  // Sets the connection up for a short transfer that is no upload. A server that is silent gets half of the time for the command,
+  // and the other half for QUIT, which libcurl then sends and waits for.
   void Prepare(bool hasBody, TCommands const& commandsAfter) {
     fConnection.Set(CURLOPT_UPLOAD, 0L);
     fConnection.Set(CURLOPT_NOBODY, hasBody ? 0L : 1L);
-    fConnection.Set(CURLOPT_TIMEOUT, static_cast<long>(fCleanUpSeconds));
+    fConnection.Set(CURLOPT_TIMEOUT, SecondsLeft());
+    fConnection.Set(CURLOPT_SERVER_RESPONSE_TIMEOUT, std::max(1L, SecondsLeft() / 2));
     fConnection.Set(CURLOPT_PREREQFUNCTION, static_cast<curl_prereq_callback>(nullptr));
     fConnection.SetCommandsAfter(commandsAfter);
   }
 
   CURLcode Command(TCommands const& commands) {
+    if (SecondsLeft() < 1) return CURLE_OPERATION_TIMEDOUT;
     Prepare(false, commands);
     return fConnection.Perform(fNames.DirectoryUrl());
   }
@@ -374,6 +388,7 @@ private:
   TUploadNames const fOthers;
   std::string const fFile;
   int const fCleanUpSeconds;
+  TClock::time_point fCleanUpEnd = TClock::time_point::max();  // no command begins after it
   TTransferState& fState;
 };
 

@@ -6,6 +6,7 @@
 #include "tools/zep/output/Terminal.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/processes/Descriptor.h"
+#include "tools/zep/processes/Interrupts.h"
 #include "tools/zep/processes/TChildProcess.h"
 #include "tools/zep/secrets/Secrets.h"
 #include "tools/zep/transfer/FileTransfer.h"
@@ -95,7 +96,10 @@ void ExplainNoConnection(TOutcome& outcome, TRemote const& remote) {
   if (outcome.fExit != kExitNoConnection) return;
   std::string const usualPort = remote.fScheme == "sftp" ? "22" : "21";
   std::string const why = WhyUnreachable(remote.fHost, remote.fPort.empty() ? usualPort : remote.fPort, kProbeSeconds);
-  if (!why.empty()) outcome.fReason += ": " + Printable(why);
+  if (PendingInterrupt() != 0)
+    outcome = Interrupted();
+  else if (!why.empty())
+    outcome.fReason += ": " + Printable(why);
 }
 
 TTransferred TransferOf(TRemote const& remote, std::string const& file) {

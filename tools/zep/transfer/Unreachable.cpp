@@ -2,12 +2,16 @@
 #include "tools/zep/transfer/Unreachable.h"
 
 #include "tools/zep/processes/Descriptor.h"
+#include "tools/zep/processes/Interrupts.h"
 
 #include <netdb.h>
 #include <poll.h>
 #include <sys/socket.h>
 
+#include <algorithm>
 #include <cerrno>
+#include <chrono>
+#include <cstdint>
 #include <memory>
 #include <system_error>
 
@@ -32,20 +36,36 @@ int Resolve(std::string const& host, std::string const& port, TAddresses& addres
   return error;
 }
 
+// Waits until connecting has ended. Returns 0, ETIMEDOUT, or EINTR after an interrupt (Interrupts.h); other signals do not
+// shorten the wait.
+int WaitForConnection(int socket, int timeoutSeconds) {
+  using TClock = std::chrono::steady_clock;
+  TClock::time_point const end = TClock::now() + std::chrono::seconds(timeoutSeconds);
+  pollfd waiting{socket, POLLOUT, 0};
+  while (PendingInterrupt() == 0) {
+    auto const left = std::chrono::ceil<std::chrono::milliseconds>(end - TClock::now()).count();
+    int const ready = ::poll(&waiting, 1, static_cast<int>(std::max<std::int64_t>(left, 0)));
+    if (ready > 0) return 0;
+    if (ready == 0) return ETIMEDOUT;
+    if (errno != EINTR) return errno;
+  }
+  return EINTR;
+}
+
 // The errno of connecting; 0 when it succeeds.
 int ErrorOfConnecting(addrinfo const& address, int timeoutSeconds) {
   TDescriptor const socket(::socket(address.ai_family, SOCK_STREAM | SOCK_NONBLOCK | SOCK_CLOEXEC, 0));
   if (!socket) return errno;
   if (::connect(socket.Get(), address.ai_addr, address.ai_addrlen) == 0) return 0;
   if (errno != EINPROGRESS) return errno;
-  pollfd waiting{socket.Get(), POLLOUT, 0};
-  if (::poll(&waiting, 1, timeoutSeconds * 1000) <= 0) return ETIMEDOUT;
-  int error = 0;
+  int error = WaitForConnection(socket.Get(), timeoutSeconds);
+  if (error != 0) return error;
   socklen_t size = sizeof error;
   return ::getsockopt(socket.Get(), SOL_SOCKET, SO_ERROR, &error, &size) == 0 ? error : errno;
 }
 
 std::string ReasonOf(int error, std::string const& host, std::string const& port) {
+  if (error == EINTR) return "interrupted";
   if (error == ECONNREFUSED)
     return host + " refuses connections to port " + port + "; is the server running, and the port right?";
   if (error == ETIMEDOUT)
@@ -64,6 +84,7 @@ std::string WhyUnreachable(std::string const& host, std::string const& port, int
   for (addrinfo const* address = addresses.get(); address != nullptr; address = address->ai_next) {
     error = ErrorOfConnecting(*address, timeoutSeconds);
     if (error == 0) return "";
+    if (error == EINTR) break;
   }
   return ReasonOf(error, host, port);
 }

@@ -113,12 +113,6 @@ TOutcome Stalled(TWatch const& watch) {
   return {kZEPStatusTransferFailure, kExitStalled, "nothing moved for " + std::to_string(watch.fStallSeconds) + " s"};
 }
 
-TOutcome Interrupted() {
-  int const signal = PendingInterrupt();
-  EExitStatus const exit = signal == SIGHUP ? kExitHangUp : signal == SIGINT ? kExitInterrupt : kExitTermination;
-  return {kZEPStatusFail, exit, "interrupted"};
-}
-
 // Reads the report until the child is done; false when it stood still for too long, or when zep is interrupted.
 bool ReadReport(TChildProcess& child, TWatch const& watch, std::string& report) {
   std::uint64_t last = BytesMoved(watch);
@@ -139,6 +133,12 @@ bool ReadReport(TChildProcess& child, TWatch const& watch, std::string& report) 
 }
 
 }  // namespace
+
+TOutcome Interrupted() {
+  int const signal = PendingInterrupt();
+  EExitStatus const exit = signal == SIGHUP ? kExitHangUp : signal == SIGINT ? kExitInterrupt : kExitTermination;
+  return {kZEPStatusFail, exit, "interrupted"};
+}
 
 TOutcome RunWatched(std::function<TZEPStatusCode()> const& transfer, TWatch const& watch) {
   TChildProcess child([&] { return ReportOfSilent(transfer, watch.fMostBytes); }, SIGKILL);  // a transfer does not outlive zep

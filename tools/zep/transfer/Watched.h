@@ -35,4 +35,7 @@ struct TOutcome {
 // outcome.
 TOutcome RunWatched(std::function<TZEPStatusCode()> const& transfer, TWatch const& watch);
 
+// The outcome when an interrupt is pending (Interrupts.h).
+TOutcome Interrupted();
+
 }  // namespace NQRVZEP20::zep

@@ -14,25 +14,24 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-constexpr std::size_t kMostBytes = 1 << 20;
-
 // What has come, and whether that was too much.
 struct TPage {
   std::string& fText;
+  std::uint64_t fMostBytes;  // 0: any number
   bool fIsTooLong = false;
 };
 
 // libcurl's write callback. What is too long is refused, which ends the transfer.
 std::size_t Append(char const* bytes, std::size_t size, std::size_t count, void* context) {
   TPage& page = *static_cast<TPage*>(context);
-  page.fIsTooLong = page.fText.size() + size * count > kMostBytes;
+  page.fIsTooLong = page.fMostBytes > 0 && page.fText.size() + size * count > page.fMostBytes;
   if (page.fIsTooLong) return 0;
   page.fText.append(bytes, size * count);
   return size * count;
 }
 
 // Empty, or why the file could not be had.
-std::string Transfer(TCurl const& curl, std::string const& url, std::string& text) {
+std::string Transfer(TCurl const& curl, std::string const& url, std::uint64_t mostBytes, std::string& text) {
   std::unique_ptr<CURL, decltype(curl_easy_cleanup)*> const transfer(curl.fInit(), curl.fCleanup);
   if (!transfer) return "libcurl does not start";
   std::array<char, CURL_ERROR_SIZE> error{};
@@ -49,11 +48,11 @@ std::string Transfer(TCurl const& curl, std::string const& url, std::string& tex
   curl.fSetOption(handle, CURLOPT_TIMEOUT, 30L);
   curl.fSetOption(handle, CURLOPT_NOSIGNAL, 1L);
   curl.fSetOption(handle, CURLOPT_WRITEFUNCTION, &Append);
-  TPage page{text};
+  TPage page{text, mostBytes};
   curl.fSetOption(handle, CURLOPT_WRITEDATA, &page);
   CURLcode const code = curl.fPerform(handle);
   if (code == CURLE_OK) return "";
-  if (page.fIsTooLong) return "it is larger than " + ExactSizeText(kMostBytes);
+  if (page.fIsTooLong) return "it is larger than " + ExactSizeText(mostBytes) + "; --max-file allows more";
   return error[0] != '\0' ? error.data() : "libcurl ends with code " + std::to_string(code);
 }
 
@@ -61,7 +60,7 @@ bool IsPlainHttp(std::string const& url) { return ::strncasecmp(url.c_str(), "ht
 
 }  // namespace
 
-TPacFile FetchPacFile(std::string const& url) {
+TPacFile FetchPacFile(std::string const& url, std::uint64_t mostBytes) {
   TPacFile file;
   if (!IsPlainHttp(url)) {
     file.fFailure = "only files of plain HTTP are fetched";
@@ -76,7 +75,7 @@ TPacFile FetchPacFile(std::string const& url) {
     file.fFailure = "libcurl does not start";
     return file;
   }
-  file.fFailure = Transfer(curl, url, file.fText);
+  file.fFailure = Transfer(curl, url, mostBytes, file.fText);
   curl.fGlobalCleanup();
   return file;
 }

@@ -215,6 +215,7 @@ TEST_F(EnvelopeTest, AReportThatIsNotSentSaysSoAndWhereItIsKept) {
   EXPECT_THAT(document["sent"]["keptIn"].get<std::string>(), testing::StartsWith(fZep.Path("work/zep-report.")));
   EXPECT_TRUE(fs::exists(document["sent"]["keptIn"].get<std::string>()));
   EXPECT_TRUE(document["sent"]["sha256"].is_null());
+  EXPECT_EQ(document["sent"]["leftOnServer"], nlohmann::json::array());
 }
 
 TEST_F(EnvelopeTest, ADocumentThatCannotBeWrittenIsNotTriedTwice) {

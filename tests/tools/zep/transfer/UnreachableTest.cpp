@@ -2,11 +2,17 @@
 #include "tools/zep/transfer/Unreachable.h"
 
 #include "tools/zep/processes/Descriptor.h"
+#include "tools/zep/processes/Interrupts.h"
 
 #include <arpa/inet.h>
 #include <gmock/gmock.h>
 #include <netinet/in.h>
+#include <signal.h>
 #include <sys/socket.h>
+#include <sys/time.h>
+
+#include <chrono>
+#include <iostream>
 
 namespace NQRVZEP20::zep {
 namespace {
@@ -26,10 +32,21 @@ public:
   }
 
   void Listen() { EXPECT_EQ(::listen(fSocket.Get(), 1), 0); }
+
+  // From now on no connection is refused, and none gets an answer: the only one that may wait is there already.
+  void Fill() {
+    EXPECT_EQ(::listen(fSocket.Get(), 0), 0);
+    sockaddr_storage name{};
+    socklen_t size = sizeof name;
+    auto* const address = reinterpret_cast<sockaddr*>(&name);
+    EXPECT_EQ(::getsockname(fSocket.Get(), address, &size), 0);
+    fWaiting = TDescriptor(::socket(AF_INET, SOCK_STREAM, 0));
+    EXPECT_EQ(::connect(fWaiting.Get(), address, size), 0);
+  }
   std::string const& Number() const { return fNumber; }
 
 private:
-  TDescriptor fSocket;
+  TDescriptor fSocket, fWaiting;
   std::string fNumber;
 };
 
@@ -44,6 +61,45 @@ TEST(UnreachableTest, AHostThatAnswersIsNotUnreachable) {
   TPort port;
   port.Listen();
   EXPECT_EQ(WhyUnreachable("127.0.0.1", port.Number(), 3), "");
+}
+
+// Lets the process do that every 100 ms from now on; a system call that waits is interrupted.
+void Repeat(void (*handler)(int)) {
+  struct sigaction action {};
+  action.sa_handler = handler;
+  ::sigaction(SIGALRM, &action, nullptr);
+  itimerval const tenthOfASecond{{0, 100000}, {0, 100000}};
+  ::setitimer(ITIMER_REAL, &tenthOfASecond, nullptr);
+}
+
+void StopRepeating() {
+  itimerval const never{};
+  ::setitimer(ITIMER_REAL, &never, nullptr);
+  ::signal(SIGALRM, SIG_DFL);
+}
+
+TEST(UnreachableTest, ASignalDoesNotShortenTheWait) {
+  TPort port;
+  port.Fill();
+  Repeat([](int) {});
+  auto const start = std::chrono::steady_clock::now();
+  std::string const why = WhyUnreachable("127.0.0.1", port.Number(), 1);
+  double const seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+  StopRepeating();
+  EXPECT_EQ(why, "127.0.0.1 does not answer at port " + port.Number() + "; is it on, and does a firewall let this port through?");
+  EXPECT_GT(seconds, 0.95);
+}
+
+TEST(UnreachableTest, AnInterruptEndsTheWaitAndIsTheReason) {
+  TPort port;
+  port.Fill();
+  EXPECT_EXIT(
+      {
+        TInterruptGuard const guard;
+        Repeat([](int) { ::raise(SIGTERM); });
+        std::cerr << WhyUnreachable("127.0.0.1", port.Number(), 600);
+      },
+      testing::KilledBySignal(SIGTERM), "^interrupted$");
 }
 
 }  // namespace
