@@ -20,16 +20,16 @@ utsname Kernel() {
   return kernel;
 }
 
-// Writes a class with a record of each structure of that type that `isThere`. `makeRecord` is given a structure and its number.
-template <class TMakeRecord, class TIsThere>
-void WriteEach(TRecordWriter& writer, TSmbiosReader const& tables, int type, TIsThere isThere, std::string const& whyNoneIsThere,
-               TMakeRecord makeRecord) {
+// Writes a class with a record of each structure of that type that is `isPresent`. `makeRecord` gets a structure and its number.
+template <class TMakeRecord, class TIsPresent>
+void WriteEach(TRecordWriter& writer, TSmbiosReader const& tables, int type, TIsPresent isPresent,
+               std::string const& whyNoneIsPresent, TMakeRecord makeRecord) {
   std::vector<TSmbiosStructure> const structures = tables.All(type);
   std::vector<TRecord> records;
   for (TSmbiosStructure const& structure : structures)
-    if (isThere(structure)) records.push_back(makeRecord(structure, static_cast<unsigned>(records.size())));
+    if (isPresent(structure)) records.push_back(makeRecord(structure, static_cast<unsigned>(records.size())));
 
-  TMissing const whyNone = structures.empty() ? tables.WhyNone(type) : TMissing{kMissingNotGiven, whyNoneIsThere};
+  TMissing const whyNone = structures.empty() ? tables.WhyNone(type) : TMissing{kMissingNotGiven, whyNoneIsPresent};
   writer.Write(makeRecord(TSmbiosStructure(whyNone), 0), records, whyNone);
 }
 
@@ -53,11 +53,11 @@ void FillHostNamespace(TMemoryNamespace& ns) {
   WriteEach(writer, tables, kSmbiosChassis, Always, "", [&](TSmbiosStructure const& chassis, unsigned number) {
     return ChassisRecord(chassis, tables.SourceOf(kSmbiosChassis), number);
   });
-  WriteEach(writer, tables, kSmbiosProcessor, IsSocketFilled, "the firmware calls every processor socket empty",
+  WriteEach(writer, tables, kSmbiosProcessor, IsSocketFilled, "the firmware reports every processor socket as empty",
             [&](TSmbiosStructure const& processor, unsigned number) {
               return ProcessorRecord(processor, tables.SourceOf(kSmbiosProcessor), number, name);
             });
-  WriteEach(writer, tables, kSmbiosMemoryDevice, IsSlotFilled, "the firmware calls every memory slot empty",
+  WriteEach(writer, tables, kSmbiosMemoryDevice, IsSlotFilled, "the firmware reports every memory slot as empty",
             [&](TSmbiosStructure const& memoryDevice, unsigned number) {
               return MemoryRecord(memoryDevice, tables.SourceOf(kSmbiosMemoryDevice), number);
             });

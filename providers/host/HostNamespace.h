@@ -5,8 +5,8 @@ namespace NQRVZEP20 {
 
 class TMemoryNamespace;
 
-// Collects what this machine says of itself and writes it into the namespace, which is empty. Where the machine keeps
-// silent, the namespace says why (TRecordWriter).
+// Collects the data of this machine and writes them into the namespace, which must be empty. The namespace states why a value is
+// missing (TRecordWriter). Blocks while the machine is read.
 void FillHostNamespace(TMemoryNamespace& ns);
 
 }  // namespace NQRVZEP20

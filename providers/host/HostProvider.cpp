@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// The provider plug-in. Loading libHost.nsp.so registers the provider "Host", whose namespace is filled when it is first
-// asked for.
+// The provider plug-in. Loading libHost.nsp.so registers the provider "Host", whose namespace is filled at the first call of
+// GetNamespace.
 
 #include "HostNamespace.h"
 #include "TNamespaceProviderManager.h"

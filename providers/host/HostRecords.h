@@ -11,15 +11,15 @@ struct utsname;
 
 namespace NQRVZEP20 {
 
-// What the operating system and this collector say of themselves.
+// The operating system and this collector as records of CIM classes.
 
-// The machine's name on the network, or what the environment variable ZEP_HOST_NAME says: with it a table of another
-// machine (ZEP_SMBIOS_TABLE) need not go by the name of this one.
+// The machine's name on the network, or the value of the environment variable ZEP_HOST_NAME, so that the table of another machine
+// (ZEP_SMBIOS_TABLE) can be reported under that machine's name.
 TSystemName SystemNameOf(utsname const& kernel);
 
 TRecord OperatingSystemRecord(TOsRelease const& release, utsname const& kernel, TSystemName const& name);
 
-// The project's version and the build that it was configured with (CMake's ZEP_BUILD_ID).
+// The version of the project and the configured build (ZEP_BUILD_ID of CMake).
 TRecord ProductRecord();
 
 }  // namespace NQRVZEP20

@@ -9,8 +9,8 @@ namespace {
 
 constexpr char const* kFiles[] = {"/etc/os-release", "/usr/lib/os-release"};
 
-// Up to the closing quote, or the end of the text where there is none. Within double quotes a backslash stands before
-// characters that would mean something to the shell.
+// The text up to the closing quote, or to its end without one. Within double quotes, a backslash escapes the characters that are
+// special to the shell.
 std::string Unquoted(std::string_view text) {
   char const quote = text.empty() ? '\0' : text[0];
   if (quote != '"' && quote != '\'') return std::string(text.substr(0, text.find_last_not_of(" \t\r") + 1));
@@ -46,8 +46,8 @@ TOsRelease TOsRelease::OfThisMachine() {
     std::ifstream file(name, std::ios::binary);
     std::string text;
     std::getline(file, text, '\0');
-    bool const isWhole = file.is_open() && !file.bad();
-    if (isWhole) return TOsRelease(name, text);
+    bool const isComplete = file.is_open() && !file.bad();
+    if (isComplete) return TOsRelease(name, text);
   }
   return TOsRelease("", "");
 }
@@ -58,7 +58,7 @@ TFinding<std::string> TOsRelease::Value(std::initializer_list<char const*> names
     auto const found = fValues.find(name);
     if (found != fValues.end() && !found->second.empty()) return found->second;
   }
-  return TMissing{kMissingNotGiven, fFile + " gives no " + *names.begin()};
+  return TMissing{kMissingNotGiven, fFile + " contains no " + *names.begin()};
 }
 
 }  // namespace NQRVZEP20

@@ -72,7 +72,7 @@ constexpr std::string_view kNumberedPlaceholders[] = {
     "a1_manufacturer", "a1_sernum", "a1_assettagnum", "array1_partnumber",
 };
 
-constexpr std::string_view kFillers = "0x-.*_#?f";  // a row of four or more of one of these is no value
+constexpr std::string_view kFillers = "0x-.*_#?f";  // a row of four or more of one of these is a placeholder
 constexpr std::size_t kShortestRow = 4;
 
 std::string Lower(std::string_view text) {
@@ -81,7 +81,7 @@ std::string Lower(std::string_view text) {
   return lower;
 }
 
-// Control characters too, such as those of a line's end.
+// True for control characters, too, such as those of a line end.
 bool IsBlank(char c) { return (c >= 0 && c <= ' ') || c == '\x7f'; }
 
 std::string_view WithoutOuterBlanks(std::string_view text) {
@@ -115,15 +115,15 @@ bool IsPlaceholder(std::string_view text) {
 }
 
 TFinding<std::string> HostNameOf(std::string const& nodeName) {
-  if (nodeName.empty()) return TMissing{kMissingNotGiven, "the kernel gives an empty host name"};
+  if (nodeName.empty()) return TMissing{kMissingNotGiven, "the kernel reports an empty host name"};
   if (nodeName == "(none)")
     return TMissing{kMissingPlaceholder, "placeholder text of the kernel: \"(none)\"; no host name is set"};
   return nodeName;
 }
 
 TFinding<std::string> WithoutPlaceholder(std::string const& text) {
-  if (WithoutOuterBlanks(text).empty()) return TMissing{kMissingNotGiven, "the firmware gives a blank text"};
-  if (HasOnly(WithoutOuterBlanks(text), '\xff'))  // memory that was never written
+  if (WithoutOuterBlanks(text).empty()) return TMissing{kMissingNotGiven, "blank in the firmware"};
+  if (HasOnly(WithoutOuterBlanks(text), '\xff'))  // flash memory that was never written
     return TMissing{kMissingNotGiven, "not programmed in the firmware's table (0xFF)"};
   if (IsPlaceholder(text)) return TMissing{kMissingPlaceholder, "placeholder text of the firmware: \"" + text + "\""};
   return text;

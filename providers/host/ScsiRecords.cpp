@@ -40,8 +40,8 @@ constexpr char const* kDeviceTypes[] = {
     "Optical Card Device",
 };
 
-// "1:0:0:0", in which Linux puts a device's host, channel, target and logical unit. The directory also holds hosts and
-// targets, which have names of other forms.
+// "1:0:0:0": the host, channel, target and logical unit of a device. The directory also contains hosts and targets, whose names
+// have other forms.
 struct TAddress {
   unsigned fHost, fChannel, fTarget;
   unsigned long fLun;
@@ -66,13 +66,13 @@ std::vector<TAddress> AddressesIn(std::string const& directory) {
   return addresses;
 }
 
-// The only line of a file of sysfs, without the blanks with which SCSI fills up its texts.
+// The only line of a file of sysfs, without the blanks with which SCSI pads its texts.
 TText ReadLine(std::string const& file) {
   std::ifstream stream(file);
   std::string line;
   if (!std::getline(stream, line)) return TMissing{kMissingUnreadable, file + " cannot be read"};
   std::size_t const first = line.find_first_not_of(' ');
-  if (first == std::string::npos) return TMissing{kMissingNotGiven, "the device gives a blank text"};
+  if (first == std::string::npos) return TMissing{kMissingNotGiven, "blank in the device"};
   return line.substr(first, line.find_last_not_of(' ') - first + 1);
 }
 

@@ -9,15 +9,15 @@
 
 namespace NQRVZEP20 {
 
-// The SCSI devices of this machine, which are also the USB and SATA disks, as the kernel shows them.
+// The SCSI devices of this machine, to which USB and SATA disks belong, as the kernel shows them.
 
-// Where the kernel shows them, or what the environment variable ZEP_SCSI_DEVICES says, for tests.
+// The directory in which the kernel shows them, or for tests the one that the environment variable ZEP_SCSI_DEVICES names.
 std::string ScsiDirectory();
 
-// One record of each device, in the order of their addresses. A device that goes away meanwhile is left out.
+// One record of each device, in the order of their addresses. A device that is removed meanwhile is omitted.
 std::vector<TRecord> ScsiRecords(std::string const& directory, TSystemName const& name);
 
-// An example of such a record without values, and why there are none.
+// A record without values, which declares the class, and the reason why there are no devices.
 TRecord ScsiShape(TSystemName const& name);
 TMissing WhyNoScsiDevices(std::string const& directory);
 

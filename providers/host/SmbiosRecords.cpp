@@ -13,13 +13,13 @@ namespace NQRVZEP20 {
 
 namespace {
 
-TMissing Unknown() { return {kMissingNotGiven, "the firmware calls it unknown"}; }
+TMissing Unknown() { return {kMissingNotGiven, "the firmware reports it as unknown"}; }
 
 TFinding<std::string> TextOf(TSmbiosStructure const& structure, std::size_t offset) {
   return structure.Text(offset).Then(WithoutPlaceholder);
 }
 
-// The number as a T, unless it is the one that stands for "unknown".
+// The number as a T; missing when it is `unknown`, the number that SMBIOS defines for that.
 template <class T, class TNumber>
 TFinding<T> NumberOf(TFinding<TNumber> const& number, TNumber unknown) {
   return number.Then([unknown](TNumber known) -> TFinding<T> {
@@ -88,7 +88,7 @@ TFinding<TCIMDateTime> DateFrom(std::string const& text) {
   }
 }
 
-// The segment at which a BIOS of the old kind begins; UEFI firmware gives 0.
+// The start address of a BIOS of the old kind, from its segment; UEFI firmware has 0.
 TFinding<std::uint64_t> StartAddressOf(TSmbiosStructure const& bios) {
   return NumberOf<std::uint64_t>(bios.Word(0x06), std::uint16_t(0)).Then([](std::uint64_t segment) { return segment << 4; });
 }
@@ -182,7 +182,7 @@ TFinding<std::string> ChassisSkuOf(TSmbiosStructure const& chassis) {
 
 // ---- Processor ----
 
-// The family, or the second family field where the first says so.
+// The family; the first field may refer to the second family field.
 TFinding<std::uint16_t> FamilyOf(TSmbiosStructure const& processor) {
   constexpr std::uint8_t unknown = 2, seeFamily2 = 0xfe;
   auto const family = processor.Byte(0x06);
@@ -236,7 +236,7 @@ TFinding<std::string> ProcessorIdFrom(std::vector<unsigned char> const& id) {
   return text;
 }
 
-// 255 in the first field stands for the wider second one, where the structure has it.
+// 255 in the first field refers to the wider second field, if the structure has it.
 TFinding<std::uint16_t> EnabledCoresOf(TSmbiosStructure const& processor) {
   auto const cores = processor.Byte(0x24);
   if (IsNumber(cores, 0xff)) {
@@ -247,12 +247,12 @@ TFinding<std::uint16_t> EnabledCoresOf(TSmbiosStructure const& processor) {
 
 // ---- Memory ----
 
-// Numbers of CIM for those of SMBIOS, from 0; -1 where SMBIOS says unknown, or knows none.
+// The CIM number for each SMBIOS number, from 0; -1 for unknown and for numbers without a meaning.
 constexpr int kFormFactors[] = {-1, 1, -1, 7, 2, 1, 3, 4, 6, 8, 9, 1, 11, 12, 13, 8, 1};
 constexpr int kMemoryTypes[] = {-1, 1,  -1, 2,  6,  7,  8,  9,  10, 11, 12, 13, 14, 15, 16, 17,
                                 18, 19, 20, 21, 23, -1, -1, -1, 24, 25, 26, 27, 28, 29, 30};
 
-// A number that SMBIOS gives and the table does not have, such as that of a newer kind of memory, is "Other".
+// A number after the end of the table, such as that of a newer kind of memory, becomes "Other".
 template <std::size_t N>
 TFinding<std::uint16_t> CimNumberOf(TFinding<std::uint8_t> const& found, int const (&table)[N]) {
   return found.Then([&table](std::uint8_t number) -> TFinding<std::uint16_t> {
@@ -277,7 +277,7 @@ TFinding<std::uint64_t> CapacityOf(TSmbiosStructure const& memoryDevice) {
   });
 }
 
-// In transfers per second, by the million, which CIM calls megahertz. 65535 stands for the wider extended field.
+// In millions of transfers per second, which CIM calls megahertz. 65535 refers to the wider extended field.
 TFinding<std::uint32_t> SpeedOf(TSmbiosStructure const& memoryDevice, std::size_t offset, std::size_t extendedOffset) {
   constexpr std::uint16_t unknown = 0, seeExtended = 0xffff;
   auto const speed = memoryDevice.Word(offset);
@@ -372,7 +372,7 @@ TRecord MemoryRecord(TSmbiosStructure const& memoryDevice, std::string const& so
   record.Add("TotalWidth", NumberOf<std::uint16_t>(memoryDevice.Word(0x08), std::uint16_t(0xffff)));
   record.Add("DataWidth", NumberOf<std::uint16_t>(memoryDevice.Word(0x0a), std::uint16_t(0xffff)));
 
-  // The speed is given in megahertz, so that the time in nanoseconds is not.
+  // SMBIOS states the speed in megahertz, not the time in nanoseconds.
   auto const speed = SpeedOf(memoryDevice, 0x15, 0x54);
   record.Add("IsSpeedInMhz", TFinding<bool>(static_cast<bool>(speed)));
   record.Add("MaxMemorySpeed", speed);

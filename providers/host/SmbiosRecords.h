@@ -10,10 +10,10 @@
 
 namespace NQRVZEP20 {
 
-// What SMBIOS structures say, as records of CIM classes: the DMTF's property names, types and numbers. `source` tells where
-// the structure was read. `number` counts the instances of the class, from 0.
+// SMBIOS structures as records of CIM classes, with the property names, types and numbers of the DMTF. `source`: the source of
+// the values. `number` counts the instances of the class, from 0.
 
-// The version decides the byte order of the UUID; without one, it is that of versions since 2.6.
+// The version determines the byte order of the UUID; without a version it is the order since version 2.6.
 TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name,
                              std::optional<TSmbiosVersion> version = std::nullopt);
 TRecord BiosRecord(TSmbiosStructure const& bios, std::string const& source, unsigned number);
@@ -21,7 +21,7 @@ TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source
 TRecord ProcessorRecord(TSmbiosStructure const& processor, std::string const& source, unsigned number, TSystemName const& name);
 TRecord MemoryRecord(TSmbiosStructure const& memoryDevice, std::string const& source, unsigned number);
 
-// False for a socket or slot that the firmware calls empty. One that it says nothing of counts as filled.
+// False for a socket or slot that the firmware reports as empty. One without that field counts as filled.
 bool IsSocketFilled(TSmbiosStructure const& processor);
 bool IsSlotFilled(TSmbiosStructure const& memoryDevice);
 

@@ -17,27 +17,27 @@ unsigned ByteAt(std::string_view bytes, std::size_t offset) { return static_cast
 
 bool StartsWith(std::string_view bytes, std::string_view start) { return bytes.substr(0, start.size()) == start; }
 
-// The bytes of a sound entry point add up to 0.
+// The sum of the bytes of a valid entry point is 0.
 bool IsSumZero(std::string_view bytes) {
   return std::accumulate(bytes.begin(), bytes.end(), 0u,
                          [](unsigned sum, char byte) { return (sum + static_cast<unsigned char>(byte)) & 0xFFu; }) == 0;
 }
 
-// `least` is what the length byte may say at least.
+// `least`: the smallest valid length.
 bool IsSound(std::string_view bytes, std::size_t lengthOffset, std::size_t least) {
   if (bytes.size() <= lengthOffset) return false;
   std::size_t const length = ByteAt(bytes, lengthOffset);
   return length >= least && length <= kLongestEntryPoint && length <= bytes.size() && IsSumZero(bytes.substr(0, length));
 }
 
-// Some firmware gives versions that there are none of: 2.31 and 2.33 stand for 2.3, 2.51 for 2.6.
+// Some firmware has versions that do not exist: 2.31 and 2.33 mean 2.3, 2.51 means 2.6.
 TSmbiosVersion Corrected(TSmbiosVersion version) {
   if (version == TSmbiosVersion(2, 31) || version == TSmbiosVersion(2, 33)) return {2, 3};
   if (version == TSmbiosVersion(2, 51)) return {2, 6};
   return version;
 }
 
-// The start of a file; empty when it cannot be read or is not a regular file, such as a pipe that would keep us waiting.
+// The start of a file. Empty when the file cannot be read, or is not a regular file: reading a pipe could block.
 std::string StartOf(std::filesystem::path const& path) {
   std::error_code ignored;
   if (!std::filesystem::is_regular_file(path, ignored)) return "";

@@ -11,12 +11,12 @@ namespace NQRVZEP20 {
 // The version of the SMBIOS standard that tables follow: major and minor, 2.8 as {2, 8}.
 using TSmbiosVersion = std::pair<unsigned, unsigned>;
 
-// The version in an entry point of any of its three forms: "_SM3_", "_SM_", and "_DMI_" of before SMBIOS 2.1. Bytes after
-// it are not looked at. None when the bytes do not begin with an entry point, or its length or checksum is wrong.
+// The version in an entry point of any of its three forms: "_SM3_", "_SM_", and "_DMI_" of before SMBIOS 2.1. Bytes after it are
+// ignored. None when the bytes do not begin with an entry point, or its length or checksum is wrong.
 std::optional<TSmbiosVersion> VersionInEntryPoint(std::string_view bytes);
 
-// The version of the tables in a file: in the entry point that the file begins with, as a dump does; for a bare table in the
-// file smbios_entry_point of the same directory, which is where the kernel puts it. None when neither has one.
+// The version of the tables in a file, from the entry point with which a dump begins; for a bare table, from the file
+// smbios_entry_point in the same directory, where the kernel has it. None when neither contains an entry point.
 std::optional<TSmbiosVersion> VersionOfTables(std::string const& tableFile);
 
 }  // namespace NQRVZEP20

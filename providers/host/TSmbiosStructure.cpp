@@ -19,7 +19,7 @@ std::uint64_t LittleEndian(std::vector<unsigned char> const& bytes) {
 }
 
 constexpr std::size_t kHeaderSize = 4;
-constexpr std::size_t kLengthOffset = 1;  // of the byte that holds the size of header and formatted area
+constexpr std::size_t kLengthOffset = 1;  // of the byte with the size of header and formatted area
 
 }  // namespace
 
@@ -50,7 +50,7 @@ TFinding<std::string> TSmbiosStructure::Text(std::size_t offset) const {
 }
 
 TFinding<std::string> TSmbiosStructure::StringAt(std::uint8_t number) const {
-  if (number == 0) return TMissing{kMissingNotGiven, "the firmware gives no text"};
+  if (number == 0) return TMissing{kMissingNotGiven, "not given by the firmware"};
 
   auto text = fBytes.begin() + FormattedSize();
   for (int at = 1; text != fBytes.end() && *text != 0; ++at) {

@@ -17,24 +17,24 @@ constexpr int kSmbiosChassis = 3;
 constexpr int kSmbiosProcessor = 4;
 constexpr int kSmbiosMemoryDevice = 17;
 
-// One SMBIOS structure: a header of four bytes, the formatted area, and the string set behind it. Whatever the bytes say,
-// nothing outside them is read. Numbers are little-endian; offsets count from the header, as the SMBIOS standard's do.
+// One SMBIOS structure: a header of four bytes, the formatted area, and the string set. Nothing outside the bytes is read,
+// whatever they contain. Numbers are little-endian; offsets count from the header, as in the SMBIOS standard.
 class TSmbiosStructure {
 public:
   explicit TSmbiosStructure(std::vector<unsigned char> bytes);
 
-  // The structure that is not there: every field is missing, for that reason.
+  // A structure that is missing: every field is missing for that reason.
   explicit TSmbiosStructure(TMissing why);
 
-  // Fields of the formatted area. Firmware of an older version of the standard gives shorter structures: a field that does
-  // not lie within the formatted area is missing.
+  // Fields of the formatted area. Older versions of the standard have shorter structures: a field that is not completely within
+  // the formatted area is missing.
   TFinding<std::uint8_t> Byte(std::size_t offset) const;
   TFinding<std::uint16_t> Word(std::size_t offset) const;
   TFinding<std::uint32_t> DWord(std::size_t offset) const;
   TFinding<std::vector<unsigned char>> Bytes(std::size_t offset, std::size_t count) const;
 
-  // The text whose number stands at that offset, as the firmware wrote it. Missing when the number is 0, when the string
-  // set has fewer texts, and when the text has no end.
+  // The string to which the field at that offset refers, verbatim. Missing when the field is 0, when the string set has fewer
+  // strings, and when the string has no end.
   TFinding<std::string> Text(std::size_t offset) const;
 
 private:
@@ -42,7 +42,7 @@ private:
   std::size_t FormattedSize() const;
 
   std::vector<unsigned char> fBytes;
-  TMissing fWhyAbsent;  // without code: the structure is there
+  TMissing fWhyAbsent;  // its code is empty when the structure is present
 };
 
 }  // namespace NQRVZEP20

@@ -7,19 +7,18 @@
 
 namespace NQRVZEP20 {
 
-// CIM names: what they may be made of, and how they compare. Case counts for nothing in A to Z, other bytes are compared
-// as they are.
+// CIM names: their characters and their comparison. The case of A to Z does not matter; other bytes are compared unchanged.
 
-// A letter or an underscore, then letters, digits and underscores. Every byte from 0x80 up counts as a letter, so that
-// UTF-8 passes.
+// A letter or an underscore, then letters, digits and underscores. Every byte from 0x80 up counts as a letter, so that a name may
+// contain UTF-8.
 bool IsCIMName(std::string const& text);
 
-// Throws kZEPStatusInvalidCIMName for what is no CIM name.
+// Throws kZEPStatusInvalidCIMName unless the text is a CIM name.
 void RequireCIMName(std::string const& text);
 
 bool IsSameName(std::string_view a, std::string_view b);
 
-// The name in small letters: one text for every spelling.
+// The name in lower case: the same text for every spelling.
 std::string FoldName(std::string name);
 
 // For unordered containers keyed by name.

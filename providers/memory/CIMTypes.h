@@ -5,7 +5,7 @@
 
 namespace NQRVZEP20 {
 
-// Questions about type tags.
+// Properties of type tags.
 
 inline TCIMValue::TCIMType BaseTypeOf(TCIMValue::TCIMType type) {
   return static_cast<TCIMValue::TCIMType::ECIMType>(type & ~TCIMValue::TCIMType::kCIMTypeArrayFlag);

@@ -7,8 +7,8 @@
 namespace NQRVZEP20 {
 
 void LogRefusal(std::string const& className, std::string const& member, TZEPException const& reason) {
-  std::string const what = member.empty() ? className : className + "." + member;
-  TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, what + " refused: " + reason.what());
+  std::string const element = member.empty() ? className : className + "." + member;
+  TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, element + " refused: " + reason.what());
 }
 
 }  // namespace NQRVZEP20

@@ -7,11 +7,11 @@
 
 namespace NQRVZEP20 {
 
-// Logs "X_Disk.Id refused: kZEPStatusTypeMismatch" as an error: an exception alone does not tell where. `member` is empty
-// when the refusal concerns the class as a whole.
+// Logs an error such as "X_Disk.Id refused: kZEPStatusTypeMismatch", because an exception does not contain the place. `member` is
+// empty when the class itself was refused.
 void LogRefusal(std::string const& className, std::string const& member, TZEPException const& reason);
 
-// Does one step of filling a namespace; when it throws, the log says what was refused.
+// Runs one step of filling a namespace. When the step throws, the refused class and member are logged.
 template <class TStep>
 auto NameRefusal(std::string const& className, std::string const& member, TStep const& step) {
   try {

@@ -34,7 +34,7 @@ TCIMValue FittedTo(TCIMValue const& pattern, TCIMValue const& value) {
 
   std::string digits = value.ToString();
   TCIMValue const converted(type, digits, boost::shared_ptr<ICIMNamespace>());
-  return converted.ToString() == digits ? converted : value;  // a number out of range reads back as another one
+  return converted.ToString() == digits ? converted : value;  // a number out of range changes
 }
 
 }  // namespace NQRVZEP20

@@ -5,9 +5,9 @@
 
 namespace NQRVZEP20 {
 
-// The value as one of the type of `pattern`, where that loses nothing, so that literals can be written plainly: a value of
-// tag 0 becomes a NULL of that type, an integer changes its width and sign when the number fits, and an array takes the
-// declared bound. Any other value comes back as it is.
+// Converts the value to the type of `pattern` if nothing is lost, so that providers can write plain literals: a value of tag 0
+// becomes a NULL of that type, an integer takes the declared width and sign if the number fits, and an array takes the declared
+// maximum size. Any other value is returned unchanged.
 TCIMValue FittedTo(TCIMValue const& pattern, TCIMValue const& value);
 
 }  // namespace NQRVZEP20

@@ -12,7 +12,7 @@ namespace NQRVZEP20 {
 
 namespace {
 
-// A value that holds a NULL char16 or datetime cannot be printed; its text is empty, as that of no other char16 or datetime.
+// A NULL char16 or datetime within a value cannot be printed. Its text is empty, which no other char16 or datetime has.
 std::string PlainText(TCIMValue const& value) {
   try {
     return value.ToString();
@@ -21,7 +21,7 @@ std::string PlainText(TCIMValue const& value) {
   }
 }
 
-// Every digit: values that differ print the same in the six that ToString gives.
+// With every digit: different values may be equal in the six digits of ToString.
 std::string ExactText(double number) {
   char text[32];
   return std::string(text, std::to_chars(text, text + sizeof text, number).ptr);
@@ -45,7 +45,7 @@ std::string KeyText(TCIMReference const& path) {
     return true;
   });
 
-  std::string text;  // each value behind its length, so that no value can look like two
+  std::string text;  // each value follows its length, so that one value cannot look like two
   for (auto const& [name, value] : keys) text += name + "=" + std::to_string(value.size()) + ":" + value;
   return text;
 }

@@ -7,10 +7,9 @@
 
 namespace NQRVZEP20 {
 
-// The key bindings of a path as one text, which two paths share when they name the same instance of a class. Names are
-// compared without regard to case and in any order, values by their text as an object path prints it, but reals with every
-// digit; two datetimes that denote one instant in two zones are two keys. A key that is NULL is left out; without any the
-// text is empty.
+// The key bindings of a path as one text. Two paths of a class have the same text if they name the same instance. The order and
+// the case of the names do not matter. Values are compared by their text in an object path, reals with every digit; datetimes of
+// the same instant in two time zones differ. NULL keys are omitted; without any key the text is empty.
 std::string KeyText(TCIMReference const& path);
 
 }  // namespace NQRVZEP20

@@ -16,11 +16,11 @@ std::vector<TStandardQualifier> StandardQualifiers() {
   constexpr unsigned int kParameter = ICIMQualifierDecl::kScopeParameter;
   constexpr unsigned int kAny = ICIMQualifierDecl::kScopeAny;
   constexpr unsigned int kAnyClass = kClass | kAssociation | kIndication;
-  constexpr unsigned int kValued = kProperty | kMethod | kParameter;  // whatever has a value of a plain type
+  constexpr unsigned int kValued = kProperty | kMethod | kParameter;  // the elements that have a value of a plain type
 
   constexpr unsigned int kDefault = ICIMQualifierDecl::kFlavorDefault;
-  constexpr unsigned int kRestricted = ICIMQualifierDecl::kFlavorEnableOverride;  // stays on its own element
-  constexpr unsigned int kFinal = ICIMQualifierDecl::kFlavorToSubclass;           // handed down, and not to be changed
+  constexpr unsigned int kRestricted = ICIMQualifierDecl::kFlavorEnableOverride;  // not inherited
+  constexpr unsigned int kFinal = ICIMQualifierDecl::kFlavorToSubclass;           // inherited, and not overridden
   constexpr unsigned int kTranslatable = kDefault | ICIMQualifierDecl::kFlavorTranslatable;
 
   using TType = TCIMValue::TCIMType;

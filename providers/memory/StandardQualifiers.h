@@ -15,7 +15,7 @@ struct TStandardQualifier {
   unsigned int fFlavor;  // of ICIMQualifierDecl::EFlavor
 };
 
-// The qualifiers that the CIM infrastructure standard (DSP0004) defines and schemas commonly write.
+// The qualifiers that the CIM infrastructure standard (DSP0004) defines and schemas commonly use.
 std::vector<TStandardQualifier> StandardQualifiers();
 
 }  // namespace NQRVZEP20

@@ -158,7 +158,7 @@ void TMemoryClass::Empty() {
   fSubClasses.clear();
 }
 
-// Depth first, with the classes still to come on a stack, the next one on top.
+// Depth first, with a stack of the pending classes, the next one on top.
 std::vector<boost::shared_ptr<TMemoryClass>> TMemoryClass::AllSubClasses() const {
   std::vector<boost::shared_ptr<TMemoryClass>> all;
   std::vector<boost::shared_ptr<TMemoryClass>> pending(fSubClasses.rbegin(), fSubClasses.rend());
@@ -171,7 +171,7 @@ std::vector<boost::shared_ptr<TMemoryClass>> TMemoryClass::AllSubClasses() const
   return all;
 }
 
-// The class and all below it. Where one is marked already, those below it are, too.
+// Marks the class and all classes below it. Below a marked class, all are marked already.
 void TMemoryClass::MarkAsAssociation() {
   std::vector<TMemoryClass*> pending{this};
   while (!pending.empty()) {
@@ -183,9 +183,9 @@ void TMemoryClass::MarkAsAssociation() {
   }
 }
 
-// Made from the nearest superclass that has one, downwards. So that the way to it stays short beside the layout itself,
-// however deep the class lies, some of the classes on the way get theirs, too; one that declares nothing shares its
-// superclass's.
+// Created from the layout of the nearest superclass that has one. Some of the classes between get a layout, too, so that the
+// steps to the next layout are few compared with its size, however deep the class is. A class that declares nothing shares the
+// layout of its superclass.
 boost::shared_ptr<TMemoryLayout const> TMemoryClass::Layout() {
   std::vector<boost::shared_ptr<TMemoryClass>> without;
   boost::shared_ptr<TMemoryClass> cls = Self();
@@ -206,7 +206,7 @@ boost::shared_ptr<TMemoryLayout const> TMemoryClass::Layout() {
   return fLayout;
 }
 
-// Puts its declarations in the place of those that they override, or adds them.
+// Replaces the declarations that its own ones override, and adds the others.
 void TMemoryClass::DeclareIn(TMemoryLayout& layout) const {
   for (auto const& decl : fPropertyDecls.Elements()) {
     layout.fDecls.Put(decl);

@@ -15,7 +15,7 @@ namespace NQRVZEP20 {
 
 class TMemoryNamespace;
 
-// A class. Made by TMemoryNamespace, which owns it; a class that outlives its namespace is empty.
+// A class. Created and owned by TMemoryNamespace; a class that outlives its namespace is empty.
 class TMemoryClass : public TMemoryNamedElement<ICIMClass> {
 public:
   TMemoryClass(boost::weak_ptr<TMemoryNamespace> ns, boost::shared_ptr<TMemoryClass> superClass, std::string const& name);
@@ -56,39 +56,38 @@ public:
 
   // ---- Filling ----
 
-  // Creates an instance, sets the values and commits it. What is refused is named in the log, as an error, before the
-  // exception passes on.
+  // Creates an instance, sets the values and commits it. A refused value is logged as an error before the exception passes on.
   boost::shared_ptr<TMemoryInstance> AddInstance(TMemoryValues const& values);
 
   // ---- For the other classes of this library ----
 
   boost::shared_ptr<TMemoryClass> SuperClass() const;  // empty for a root class
 
-  // The declaration in this class or the nearest in its superclasses; empty when there is none.
+  // The declaration in this class or in the nearest superclass; empty when there is none.
   boost::shared_ptr<TMemoryPropertyDecl> FindPropertyDecl(std::string const& name) const;
 
-  bool HasMadeInstances() const { return fHasMadeInstances; }  // or a subclass has
+  bool HasMadeInstances() const { return fHasMadeInstances; }  // or a subclass has made some
 
-  // The instance of this class itself that was committed with the keys of the path; empty when there is none.
+  // The committed instance of this class itself that has the keys of the path; empty when there is none.
   boost::shared_ptr<TMemoryInstance> FindInstance(TCIMReference const& path) const;
 
   void AddSubClass(boost::shared_ptr<TMemoryClass> subClass) { fSubClasses.push_back(subClass); }
 
-  // Lets go of everything but the name. Values refer to classes as owners do, so that classes can own one another in
-  // circles; the namespace breaks these when it goes.
+  // Releases everything except the name. A value owns the class that it refers to, so classes can own one another in circles,
+  // which the namespace breaks when it is destroyed.
   void Empty();
 
 private:
   boost::shared_ptr<TMemoryClass> Self() { return boost::static_pointer_cast<TMemoryClass>(shared_from_this()); }
-  boost::shared_ptr<TMemoryLayout const> Layout();  // made at the first call
+  boost::shared_ptr<TMemoryLayout const> Layout();  // created by the first call
   void DeclareIn(TMemoryLayout& layout) const;
   void MarkAsAssociation();
   std::vector<boost::shared_ptr<TMemoryClass>> AllSubClasses() const;  // in the order of EnumerateSubClasses
 
   bool const fIsRoot;
   bool fIsDeclaring = false;
-  bool fIsAssociation;             // it or a superclass carries the qualifier
-  bool fHasMadeInstances = false;  // or a subclass has
+  bool fIsAssociation;             // it or a superclass has the qualifier
+  bool fHasMadeInstances = false;  // or a subclass has made some
   boost::weak_ptr<TMemoryClass> fSuperClass;
   std::vector<boost::shared_ptr<TMemoryClass>> fSubClasses;  // the direct ones
 
@@ -96,7 +95,7 @@ private:
   TNamedList<TMemoryMethodDecl> fMethodDecls;
   TNamedList<TMemoryProperty> fStaticProperties;
 
-  boost::shared_ptr<TMemoryLayout const> fLayout;  // made for the first instance; some superclasses have one, too
+  boost::shared_ptr<TMemoryLayout const> fLayout;  // created for the first instance; some superclasses have one, too
   std::vector<boost::shared_ptr<TMemoryInstance>> fInstances;
   std::unordered_map<std::string, boost::shared_ptr<TMemoryInstance>> fInstancesByKeys;  // those that have a key value
 };

@@ -69,7 +69,7 @@ TMemoryClassBuilder& TMemoryClassBuilder::In(std::string const& name, TMemoryTyp
   return Parameter(name, type).Qualifier("In", true);
 }
 
-// A parameter is an input unless it says otherwise, as the declaration of In has it.
+// The qualifier In is true by default: a parameter is an input unless it states otherwise.
 TMemoryClassBuilder& TMemoryClassBuilder::Out(std::string const& name, TMemoryType const& type) {
   return Parameter(name, type).Qualifier("In", false).Qualifier("Out", true);
 }

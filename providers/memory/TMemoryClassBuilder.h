@@ -16,15 +16,15 @@ class ICIMNamedElement;
 class ICIMNamespace;
 class TMemoryClass;
 
-// Describes a class in the order in which a schema would; TMemoryNamespace::DefineClass makes one. Every operation returns
-// the builder itself. A qualifier is written on what was described last: the class, a property, a method or a parameter.
+// Describes a class in the order of a schema. TMemoryNamespace::DefineClass returns a builder, and so does every operation. A
+// qualifier belongs to the element described last: the class, a property, a method or a parameter.
 //
 //   ns->DefineClass("X_Disk", "X_Device")
 //       .Description("A disk of this machine.")
 //       .Property("State", "uint16").ValueMap({"0", "1"}, {"Unknown", "Ready"})
 //       .Method("Reset", "uint32").In("Force", "boolean").Out("Log", "string[]");
 //
-// What is refused is named in the log, as an error, before the exception passes on; what was described before stays.
+// A refused element is logged as an error before the exception passes on; the elements before it remain.
 class TMemoryClassBuilder {
 public:
   explicit TMemoryClassBuilder(boost::shared_ptr<TMemoryClass> cls);
@@ -34,15 +34,14 @@ public:
   TMemoryClassBuilder& Property(std::string const& name, TMemoryType const& type, TCIMValue const& defaultValue = TCIMValue());
   TMemoryClassBuilder& Key(std::string const& name, TMemoryType const& type);
 
-  // A property that refers to instances of that class, which is there already.
+  // A property that refers to instances of that class, which must exist.
   TMemoryClassBuilder& Reference(std::string const& name, std::string const& className);
   TMemoryClassBuilder& KeyReference(std::string const& name, std::string const& className);
 
   // A property whose value belongs to the class.
   TMemoryClassBuilder& Static(std::string const& name, TMemoryType const& type, TCIMValue const& value);
 
-  // ---- Methods, and the parameters of the method described last. What goes in and comes out is an In with the qualifier
-  //      Out. ----
+  // ---- Methods, and the parameters of the method described last. An in-out parameter is an In with the qualifier Out. ----
 
   TMemoryClassBuilder& Method(std::string const& name, TMemoryType const& returnType);
   TMemoryClassBuilder& In(std::string const& name, TMemoryType const& type);
@@ -53,9 +52,9 @@ public:
   TMemoryClassBuilder& Abstract();
   TMemoryClassBuilder& Association();
   TMemoryClassBuilder& Description(std::string const& text);
-  TMemoryClassBuilder& Override();  // on a property that a superclass declares too
+  TMemoryClassBuilder& Override();  // for a property that a superclass declares, too
 
-  // What the values of an enumeration mean, one word for each.
+  // The values of an enumeration, and a word for each.
   TMemoryClassBuilder& ValueMap(std::vector<std::string> const& values, std::vector<std::string> const& words);
 
   // Any qualifier that the namespace declares, with its declared flavor. An integer may be given in any integer type.
@@ -68,8 +67,8 @@ private:
   std::string ClassName() const;
 
   boost::shared_ptr<TMemoryClass> fClass;
-  boost::shared_ptr<ICIMMethodDecl> fMethod;     // the one described last; empty until then
-  boost::shared_ptr<ICIMNamedElement> fElement;  // what was described last
+  boost::shared_ptr<ICIMMethodDecl> fMethod;     // the method described last; empty before the first
+  boost::shared_ptr<ICIMNamedElement> fElement;  // the element described last
 };
 
 }  // namespace NQRVZEP20

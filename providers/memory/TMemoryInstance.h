@@ -15,17 +15,17 @@ namespace NQRVZEP20 {
 class TMemoryClass;
 class TMemoryPropertyDecl;
 
-// Property values by name, as an instance is filled with them: {{"Id", 5u}, {"Name", "sda"}}.
+// The property values of a new instance by name: {{"Id", 5u}, {"Name", "sda"}}.
 using TMemoryValues = std::vector<std::pair<std::string, TCIMValue>>;
 
-// What all instances of a class have in common: the declarations of all their properties, inherited ones included, in the
-// order of ICIMInstance::EnumerateProperties; and which of them are keys.
+// The layout that all instances of a class share: the declarations of all properties, including inherited ones, in the order of
+// ICIMInstance::EnumerateProperties; and the positions of the keys.
 struct TMemoryLayout {
   TNamedList<TMemoryPropertyDecl const> fDecls;
   std::vector<std::size_t> fKeys;  // positions in fDecls
 };
 
-// An instance. Made by TMemoryClass.
+// An instance. Created by TMemoryClass.
 class TMemoryInstance : public ICIMInstance {
 public:
   TMemoryInstance(boost::weak_ptr<TMemoryClass> cls, boost::shared_ptr<TMemoryLayout const> layout);
@@ -38,23 +38,23 @@ public:
 
   // ---- Filling ----
 
-  // Sets a property. An integer may be given in any integer type that the declared one can stand in for: 8 does for a
-  // uint16. TCIMValue() makes the property NULL, whatever its type. Throws kZEPStatusNotFound for a name that the class
-  // does not have, and what ICIMProperty::SetValue throws.
+  // Sets a property. An integer may have any integer type if the declared type can hold the number: 8 fits a uint16. TCIMValue()
+  // makes a property of any type NULL. Throws kZEPStatusNotFound for a property that the class does not have, and everything that
+  // ICIMProperty::SetValue throws.
   void Set(std::string const& name, TCIMValue const& value);
 
-  // The value of a property; throws kZEPStatusNotFound for a name that the class does not have.
+  // The value of a property; throws kZEPStatusNotFound for a property that the class does not have.
   TCIMValue Get(std::string const& name) const;
 
-  // The path as a value, which a reference property of another instance takes.
+  // The path as a value for a reference property of another instance.
   TCIMValue GetReference() const;
 
-  // ---- For TMemoryClass, which files the instance ----
+  // ---- For TMemoryClass, which stores the instance by its keys ----
 
   bool IsCommitted() const { return fIsCommitted; }
-  void SetCommitted();  // its keys are fixed from now on
+  void SetCommitted();  // after this call its keys cannot change
 
-  // Makes its references NULL: a reference that was resolved owns the instance that it found, and that may be this one.
+  // Makes its references NULL: a resolved reference owns the instance that it found, which may be this one.
   void DropReferences();
 
 private:

@@ -7,7 +7,7 @@ namespace NQRVZEP20 {
 
 namespace {
 
-// What a parameter may be declared as; see ICIMMethodDecl::AddParameterDecl.
+// Checks the type of a parameter; see ICIMMethodDecl::AddParameterDecl.
 void RequireParameterType(TCIMValue::TCIMType type, unsigned int maxArraySize, std::string const& referencedClassName) {
   if (!HasTypeName(type)) throw TZEPException(kZEPStatusTypeMismatch);
   if (maxArraySize != 0 && !IsArrayType(type)) throw TZEPException(kZEPStatusNotArray);

@@ -7,7 +7,7 @@
 
 namespace NQRVZEP20 {
 
-// A method declaration. Made by TMemoryClass.
+// A method declaration. Created by TMemoryClass.
 class TMemoryMethodDecl : public TMemoryNamedElement<ICIMMethodDecl> {
 public:
   TMemoryMethodDecl(std::string const& name, TCIMValue::TCIMType returnType, boost::weak_ptr<ICIMNamedElement> owner,

@@ -13,7 +13,7 @@
 
 namespace NQRVZEP20 {
 
-// The name and the qualifiers of an element: what classes, property, method and parameter declarations have in common.
+// The name and the qualifiers of an element, for classes and for declarations of properties, methods and parameters.
 // `TInterface` is the element's own interface, which derives from ICIMNamedElement.
 template <class TInterface>
 class TMemoryNamedElement : public TInterface, public boost::enable_shared_from_this<TMemoryNamedElement<TInterface>> {
@@ -37,7 +37,7 @@ public:
     if (value.GetType() != declaration->GetType(context)) throw TZEPException(kZEPStatusTypeMismatch);
     if (fQualifiers.Has(name)) throw TZEPException(kZEPStatusAlreadyExists);
 
-    auto const own = boost::static_pointer_cast<TMemoryQualifierDecl>(declaration);  // the namespace made it
+    auto const own = boost::static_pointer_cast<TMemoryQualifierDecl>(declaration);  // the namespace created it
     auto const qualifier = boost::make_shared<TMemoryQualifier>(own, this->weak_from_this(), value, flavor);
     fQualifiers.Add(qualifier);
     return qualifier;
@@ -45,7 +45,7 @@ public:
 
   std::string const& Name() const { return fName; }
 
-  // Whether the element itself carries the qualifier, with any value but false.
+  // Whether the element itself has the qualifier, with any value except false.
   bool IsMarked(std::string const& qualifierName) const {
     boost::shared_ptr<TMemoryQualifier> const qualifier = fQualifiers.Find(qualifierName);
     return qualifier && qualifier->IsSet();

@@ -16,17 +16,17 @@ namespace NQRVZEP20 {
 class TMemoryClass;
 class TMemoryQualifierDecl;
 
-// A CIM namespace that lies in memory: what a provider plug-in fills, and what CIM objects are copied into.
+// A CIM namespace in memory, for a provider plug-in to fill, or for a copy of another namespace.
 //
 //   auto ns = boost::make_shared<TMemoryNamespace>("root/storage");
 //   ns->DefineClass("X_Device").Abstract().Key("Id", "uint32");
 //   ns->DefineClass("X_Disk", "X_Device").Property("Name", "string").Property("Sizes", "uint64[4]");
 //   ns->AddInstance("X_Disk", {{"Id", 5}, {"Name", "sda"}});
 //
-// Always held by boost::shared_ptr. It owns everything in it and lets go of everything when it goes: a class that someone
-// still holds then is empty, an instance keeps its values but for references, and what looks for the namespace, or for a
-// class that nobody holds, throws boost::bad_weak_ptr. Lookups by name and by object path take constant time. Contexts are
-// ignored. Several threads may read at once while none writes.
+// Always held by boost::shared_ptr. The namespace owns its contents and releases them when it is destroyed. A class that outlives
+// it is empty, and an instance keeps its values except references; an operation that needs the namespace, or a class that was
+// destroyed, throws boost::bad_weak_ptr. Lookups by name and by object path take constant time. Contexts are ignored. Several
+// threads may read at the same time while none writes.
 class TMemoryNamespace : public ICIMNamespace, public boost::enable_shared_from_this<TMemoryNamespace> {
 public:
   // Empty: without classes and without qualifier declarations.
@@ -47,23 +47,22 @@ public:
                                TCIMContext const& context) const override;
 
   // A path names an instance by its own class and exactly its keys (those that are not NULL): a path with the name of the
-  // superclass finds only instances of the superclass itself. Class and key names are compared without regard to case, key
-  // values by their text, which for reals has every digit. An instance without any key value has no path of its own and is never
-  // found; nothing keeps a class from having several such instances.
+  // superclass finds only instances of the superclass itself. Case does not matter in class and key names. Key values are
+  // compared by their text, which has every digit of a real. An instance without any key value has no path of its own and is
+  // never found; a class may have several such instances.
   boost::shared_ptr<ICIMInstance> GetInstance(TCIMReference const& path, TCIMContext const& context) const override;
 
-  // ---- Filling. Whatever is refused is named in the log, as an error, before the exception passes on. ----
+  // ---- Filling. A refused element is logged as an error before the exception passes on. ----
 
-  // Creates a class, under `superClassName` unless that is empty, and hands out a builder that describes it. Declares the
-  // standard qualifiers first if that was not done yet. Throws what CreateClass throws, and kZEPStatusNotFound for a
-  // superclass that is not there.
+  // Creates a class, below `superClassName` unless that is empty, and returns a builder that describes it. The first call
+  // declares the standard qualifiers. Throws everything that CreateClass throws, and kZEPStatusNotFound for a missing superclass.
   TMemoryClassBuilder DefineClass(std::string const& name, std::string const& superClassName = "");
 
-  // Creates an instance of the class, sets the values and commits it; see TMemoryInstance::Set. Throws kZEPStatusNotFound
-  // for a class or property that is not there.
+  // Creates an instance of the class, sets the values and commits it; see TMemoryInstance::Set. Throws kZEPStatusNotFound for a
+  // missing class or property.
   boost::shared_ptr<TMemoryInstance> AddInstance(std::string const& className, TMemoryValues const& values);
 
-  // Declares the qualifiers that CIM itself defines (StandardQualifiers.cpp lists them), but for those already there.
+  // Declares the qualifiers that CIM itself defines (StandardQualifiers.cpp lists them), except those already declared.
   void DeclareStandardQualifiers();
 
 private:

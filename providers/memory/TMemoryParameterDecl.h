@@ -6,7 +6,7 @@
 
 namespace NQRVZEP20 {
 
-// A parameter declaration. Made by TMemoryMethodDecl.
+// A parameter declaration. Created by TMemoryMethodDecl.
 class TMemoryParameterDecl : public TMemoryNamedElement<ICIMParameterDecl> {
 public:
   TMemoryParameterDecl(std::string const& name, TCIMValue::TCIMType type, unsigned int maxArraySize,

@@ -18,7 +18,7 @@ void TMemoryProperty::SetValue(TCIMValue const& value, TCIMContext const&) {
   if (fIsFixed) throw TZEPException(kZEPStatusInvalidOpSequence);
   if (value.GetType() != fValue.GetType()) throw TZEPException(kZEPStatusTypeMismatch);
 
-  // Assigning a value that compares equal changes nothing, and any two char16 compare equal. So forget the old one first.
+  // An assignment of an equal value changes nothing, and any two char16 are equal. Therefore the old value is dropped first.
   TCIMValue copy(value);
   fValue.SetNullValue(TCIMValue::TCIMType::kCIMTypeInvalid, 0);
   fValue = std::move(copy);

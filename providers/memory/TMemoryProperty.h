@@ -8,7 +8,7 @@ namespace NQRVZEP20 {
 
 class TMemoryPropertyDecl;
 
-// One property value. Made by TMemoryClass, for an instance or for the class itself.
+// One property value. Created by TMemoryClass, for an instance or for the class itself.
 class TMemoryProperty : public ICIMProperty {
 public:
   // Starts with the declared default.
@@ -21,7 +21,7 @@ public:
 
   std::string const& Name() const;
 
-  // From now on SetValue throws kZEPStatusInvalidOpSequence: the value is a key by which the instance is filed.
+  // Afterwards SetValue throws kZEPStatusInvalidOpSequence: the instance is stored by this key.
   void Fix() { fIsFixed = true; }
 
   // Makes a reference, or an array of references, NULL.

@@ -9,7 +9,7 @@ namespace NQRVZEP20 {
 
 class TMemoryClass;
 
-// A property declaration. Made by TMemoryClass.
+// A property declaration. Created by TMemoryClass.
 class TMemoryPropertyDecl : public TMemoryNamedElement<ICIMPropertyDecl> {
 public:
   TMemoryPropertyDecl(std::string const& name, TCIMValue const& defaultValue, boost::weak_ptr<TMemoryClass> owner,

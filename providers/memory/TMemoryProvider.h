@@ -12,8 +12,8 @@ namespace NQRVZEP20 {
 
 class TMemoryNamespace;
 
-// A provider that hands out one namespace in memory, which a function fills when it is first asked for. A plug-in makes
-// and registers it in its start-up code, where collecting the data would be too early:
+// A provider of one namespace in memory, which a function fills at the first call of GetNamespace. A plug-in creates and
+// registers the provider in its start-up code, where collecting the data would be too early:
 //
 //   boost::make_shared<TMemoryProvider>("Clock", "root/clock", FillNamespace)
 class TMemoryProvider : public INamespaceProvider {
@@ -25,7 +25,7 @@ public:
 
   std::string const& GetName(TCIMContext const& context) const override;
 
-  // What the function throws passes on, and the half-filled namespace is dropped: the next call tries again.
+  // An exception of the function passes on, and the incomplete namespace is dropped: the next call fills a new one.
   boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) override;
 
 private:

@@ -7,7 +7,7 @@
 
 namespace NQRVZEP20 {
 
-// A qualifier on one element. Made by AddQualifier of that element; never changes.
+// A qualifier of one element. Created by AddQualifier of that element; immutable.
 class TMemoryQualifier : public ICIMQualifier {
 public:
   TMemoryQualifier(boost::shared_ptr<TMemoryQualifierDecl> declaration, boost::weak_ptr<ICIMNamedElement> owner,
@@ -21,7 +21,7 @@ public:
 
   std::string const& Name() const { return fDeclaration->Name(); }
 
-  // False for the boolean value false, with which a qualifier counts as if it were not written.
+  // False for the boolean value false: a qualifier whose value is false counts as absent.
   bool IsSet() const;
 
 private:

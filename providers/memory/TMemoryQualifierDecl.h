@@ -7,7 +7,7 @@
 
 namespace NQRVZEP20 {
 
-// A qualifier declaration. Made by TMemoryNamespace; never changes.
+// A qualifier declaration. Created by TMemoryNamespace; immutable.
 class TMemoryQualifierDecl : public ICIMQualifierDecl {
 public:
   TMemoryQualifierDecl(std::string const& name, TCIMValue const& defaultValue, unsigned int scope, unsigned int flavor);

@@ -12,8 +12,8 @@
 
 namespace NQRVZEP20 {
 
-// Calls back with each element, in order, until a call returns false; false when one did. An element that leaves the list
-// during the walk is not touched again, and one that comes is visited too.
+// Calls back with each element, in order, until a call returns false; returns false when one did. An element that is removed
+// meanwhile is not visited, and one that is added is.
 template <class TElement, class TCallback>
 bool VisitEach(std::vector<boost::shared_ptr<TElement>> const& elements, TCallback const& callback) {
   for (std::size_t i = 0; i < elements.size(); ++i) {
@@ -23,14 +23,14 @@ bool VisitEach(std::vector<boost::shared_ptr<TElement>> const& elements, TCallba
   return true;
 }
 
-// Elements in the order in which they were added, which are found by name in constant time. An element tells its name by
-// Name(). Most lists are short, and there are very many: one of few elements has no index, and no list has names of its own.
+// Elements in the order in which they were added, found by name in constant time. Name() of an element is its name. Most lists
+// are short, and there are very many of them: a list of few elements has no index, and no list copies the names.
 template <class TElement>
 class TNamedList {
 public:
   static constexpr std::size_t kNone = static_cast<std::size_t>(-1);
 
-  // The list has no element of that name yet.
+  // The list must not contain an element of that name.
   void Add(boost::shared_ptr<TElement> element) {
     fElements.push_back(std::move(element));
     if (fElements.size() <= kMostWithoutIndex) return;
@@ -40,7 +40,7 @@ public:
       Enter(fElements.size() - 1);
   }
 
-  // Takes the place of the element of that name, which is there, or else goes to the end.
+  // Replaces the element of that name, or adds it at the end.
   void Put(boost::shared_ptr<TElement> element) {
     std::size_t const position = PositionOf(element->Name());
     if (position == kNone) return Add(std::move(element));
@@ -59,7 +59,7 @@ public:
     return kNone;
   }
 
-  // Empty when there is none of that name.
+  // Empty when the list has no element of that name.
   boost::shared_ptr<TElement> Find(std::string const& name) const {
     std::size_t const position = PositionOf(name);
     return position == kNone ? boost::shared_ptr<TElement>() : fElements[position];
@@ -75,7 +75,7 @@ public:
 private:
   static constexpr std::size_t kMostWithoutIndex = 8;
 
-  // The slot of the element of that name, or the free one where it belongs.
+  // The slot of the element of that name, or the free slot for it.
   std::size_t SlotOf(std::string const& name) const {
     std::size_t const mask = fIndex.size() - 1;
     std::size_t slot = TNameHash()(name) & mask;
@@ -85,7 +85,7 @@ private:
 
   void Enter(std::size_t position) { fIndex[SlotOf(fElements[position]->Name())] = static_cast<std::uint32_t>(position + 1); }
 
-  // Anew, with room for as many again.
+  // Rebuilds the index, large enough for the list to double.
   void MakeIndex() {
     std::size_t size = 4 * kMostWithoutIndex;
     while (size < 3 * fElements.size()) size *= 2;

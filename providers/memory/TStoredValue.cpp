@@ -92,7 +92,7 @@ TStoredValue::TStoredValue(TCIMValue const& value) : fType(value.GetType()), fMa
 }
 
 TCIMValue TStoredValue::Get() const {
-  if (auto const* const whole = std::get_if<std::unique_ptr<TCIMValue>>(&fData)) return **whole;
+  if (auto const* const value = std::get_if<std::unique_ptr<TCIMValue>>(&fData)) return **value;
   if (bool const* const boolean = std::get_if<bool>(&fData)) return TCIMValue(*boolean);
   auto const* const strings = std::get_if<TStrings>(&fData);
   if (!strings) {

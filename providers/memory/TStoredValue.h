@@ -8,8 +8,8 @@
 
 namespace NQRVZEP20 {
 
-// A value that is kept and seldom looked at: the same as a TCIMValue in less room, which is made again when it is asked for.
-// Schemas are made of NULL values, booleans, strings and arrays of strings.
+// A value in less memory than a TCIMValue takes, for values that are rarely read: Get creates the TCIMValue. Most values of
+// schemas are NULL, booleans, strings and arrays of strings.
 class TStoredValue {
 public:
   explicit TStoredValue(TCIMValue const& value);
@@ -19,8 +19,8 @@ public:
   bool IsFalse() const;  // the boolean value false
 
 private:
-  struct TNull {};                           // of no class
-  using TStrings = std::unique_ptr<char[]>;  // the count, then each text after its length; numbers of four bytes
+  struct TNull {};                           // without a referenced class
+  using TStrings = std::unique_ptr<char[]>;  // the count, then each length and text; the numbers have four bytes
 
   TCIMValue::TCIMType fType;
   unsigned int fMaxArraySize;

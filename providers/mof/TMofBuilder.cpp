@@ -40,16 +40,16 @@ void TMofBuilder::DeclareQualifier(TMofQualifierDecl const& decl) {
   TCIMValue value(decl.fType.fType, decl.fType.fMaxArraySize);
   if (decl.fValue) value = ReadMofValue(*decl.fValue, decl.fType.fType, decl.fType.fMaxArraySize, fNamespace);
   StepAt(decl.fName, kZEPStatusAlreadyExists, "is already declared",
-          [&] { fNamespace->CreateQualifierDecl(TextAt(decl.fName), value, decl.fScope, decl.fFlavor, kNone); });
+         [&] { fNamespace->CreateQualifierDecl(TextAt(decl.fName), value, decl.fScope, decl.fFlavor, kNone); });
 }
 
 boost::shared_ptr<ICIMClass> TMofBuilder::CreateClass(TMofClass const& cls) {
   boost::shared_ptr<ICIMClass> superClass;
   if (!cls.fSuperClass.fText.empty())
     superClass = StepAt(cls.fSuperClass, kZEPStatusNotFound, "is not declared: a superclass must come before its subclasses",
-                         [&] { return fNamespace->GetClass(TextAt(cls.fSuperClass), kNone); });
+                        [&] { return fNamespace->GetClass(TextAt(cls.fSuperClass), kNone); });
   return StepAt(cls.fName, kZEPStatusAlreadyExists, "is already declared",
-                 [&] { return fNamespace->CreateClass(superClass, TextAt(cls.fName), kNone); });
+                [&] { return fNamespace->CreateClass(superClass, TextAt(cls.fName), kNone); });
 }
 
 void TMofBuilder::DescribeClass(TMofClass const& cls, ICIMClass& made) {
@@ -68,7 +68,7 @@ void TMofBuilder::AddProperty(TMofFeature const& property, ICIMClass& cls) {
     if (!written.IsNull()) target = TCIMValue(written);
   }
   auto const made = StepAt(property.fName, kZEPStatusAlreadyExists, "is already declared in this class",
-                            [&] { return cls.AddPropertyDecl(TextAt(property.fName), value, kNone); });
+                           [&] { return cls.AddPropertyDecl(TextAt(property.fName), value, kNone); });
   AddQualifiers(property.fQualifiers, *made);
   if (!staticValue.IsNull())
     StepAt(property.fName, kZEPStatusOK, "", [&] { cls.SetStaticProperty(TextAt(property.fName), staticValue, kNone); });
@@ -78,7 +78,7 @@ void TMofBuilder::AddMethod(TMofFeature const& method, ICIMClass& cls) {
   if (method.fType.fType == TType::kCIMTypeReference || IsArrayType(method.fType.fType))
     throw TMofError(method.fName, "a method cannot return a reference or an array");
   auto const made = StepAt(method.fName, kZEPStatusAlreadyExists, "is already declared in this class",
-                            [&] { return cls.AddMethodDecl(TextAt(method.fName), method.fType.fType, kNone); });
+                           [&] { return cls.AddMethodDecl(TextAt(method.fName), method.fType.fType, kNone); });
   AddQualifiers(method.fQualifiers, *made);
   for (TMofParameter const& parameter : method.fParameters) AddParameter(parameter, *made);
 }
@@ -98,7 +98,7 @@ void TMofBuilder::AddQualifiers(TMofQualifiers const& qualifiers, ICIMNamedEleme
     TDeclaredQualifier const& declared = Declared(qualifier.fName);
     TCIMValue const value = ValueOf(qualifier, declared);
     StepAt(qualifier.fName, kZEPStatusAlreadyExists, "is given twice",
-            [&] { element.AddQualifier(declared.fDecl, value, qualifier.fFlavor.value_or(declared.fFlavor), kNone); });
+           [&] { element.AddQualifier(declared.fDecl, value, qualifier.fFlavor.value_or(declared.fFlavor), kNone); });
   }
 }
 

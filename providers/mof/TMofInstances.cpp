@@ -37,9 +37,9 @@ void TMofInstances::Build() {
 
 void TMofInstances::Create(TMofInstance const& instance) {
   auto const cls = StepAt(instance.fClassName, kZEPStatusNotFound, "is not a declared class",
-                           [&] { return fNamespace->GetClass(TextAt(instance.fClassName), kNone); });
+                          [&] { return fNamespace->GetClass(TextAt(instance.fClassName), kNone); });
   auto const made = StepAt(instance.fClassName, kZEPStatusInvalidClass, "is abstract and cannot have instances",
-                            [&] { return cls->CreateInstance(kNone); });
+                           [&] { return cls->CreateInstance(kNone); });
   if (!instance.fAlias.fText.empty() && !fAliases.emplace(FoldName(TextAt(instance.fAlias)), fCreated.size()).second)
     throw TMofError(instance.fAlias, TextAt(instance.fAlias) + " is already the alias of another instance");
   fCreated.push_back({instance.fClassName, cls, made, kNotSet});
@@ -86,7 +86,7 @@ void TMofInstances::SetAliases(std::size_t number, bool keys) {
 
 void TMofInstances::Commit(std::size_t number) {
   StepAt(fCreated[number].fClassName, kZEPStatusAlreadyExists, "already has an instance with the same keys",
-          [&] { fCreated[number].fClass->CommitInstance(fCreated[number].fInstance, kNone); });
+         [&] { fCreated[number].fClass->CommitInstance(fCreated[number].fInstance, kNone); });
 }
 
 boost::shared_ptr<ICIMProperty> TMofInstances::PropertyOf(std::size_t number, TMofSpan const& name) const {

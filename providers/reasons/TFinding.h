@@ -41,7 +41,7 @@ public:
   // True when there is a value.
   explicit operator bool() const { return std::holds_alternative<T>(fContent); }
 
-  // The value. Throw std::bad_variant_access when it is missing.
+  // The value. Both throw std::bad_variant_access when it is missing.
   T const& operator*() const { return std::get<T>(fContent); }
   T const* operator->() const { return &std::get<T>(fContent); }
 

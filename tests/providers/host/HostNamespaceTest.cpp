@@ -68,7 +68,7 @@ protected:
     return TextOf(*instances.at(0), property);
   }
 
-  // "path property: code" of each value that is missing from instances of the class, or of the whole class.
+  // "property: reason" of each missing value of the instances of the class, and of the class itself.
   std::vector<std::string> MissingOf(std::string const& className) {
     std::vector<std::string> missing;
     for (auto const& instance : InstancesOf("ZEP_MissingValue"))
@@ -82,10 +82,10 @@ protected:
   boost::shared_ptr<TMemoryNamespace> fNs;
 };
 
-// The value, or the status that is thrown.
-std::string Asked(std::function<std::string()> const& ask) {
+// The value, or the name of the thrown status.
+std::string ResultOf(std::function<std::string()> const& query) {
   try {
-    return ask();
+    return query();
   } catch (TZEPException const& thrown) {
     return thrown.what();
   }
@@ -106,17 +106,17 @@ TEST_F(HostNamespaceTest, TheSchemaHelperReadsTheRealTables) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.table);
     FillFromFile(RealTablePath(row.table));
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSystemProductName(fNs); }), row.product);
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetMTM(fNs); }), row.mtm);
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSerialNumber(fNs, TCIMContext()); }), row.serial);
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetSystemName(fNs); }), "db1");
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetDataSourceVersion(fNs, TCIMContext()); }), TEST_VERSION);
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetDataSourceBuild(fNs, TCIMContext()); }), TEST_BUILD_ID);
-    EXPECT_EQ(Asked([&] { return TCIMSchemaHelper::GetOperatingSystemType(fNs); }), "Linux");
+    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetSystemProductName(fNs); }), row.product);
+    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetMTM(fNs); }), row.mtm);
+    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetSerialNumber(fNs, TCIMContext()); }), row.serial);
+    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetSystemName(fNs); }), "db1");
+    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetDataSourceVersion(fNs, TCIMContext()); }), TEST_VERSION);
+    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetDataSourceBuild(fNs, TCIMContext()); }), TEST_BUILD_ID);
+    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetOperatingSystemType(fNs); }), "Linux");
   }
 }
 
-TEST_F(HostNamespaceTest, TheSampleIsReadWhole) {
+TEST_F(HostNamespaceTest, TheSampleIsReadCompletely) {
   FillFromFile(SamplePath());
   EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "UUID"), "6F1D2C3B-4A59-4687-9708-1A2B3C4D5E6F");
   EXPECT_EQ(TextOfOnly("CIM_BIOSElement", "Version"), "-[QAE118B-1.30]-");
@@ -129,7 +129,7 @@ TEST_F(HostNamespaceTest, TheSampleIsReadWhole) {
   EXPECT_EQ(TextOf(*InstancesOf("CIM_PhysicalMemory")[7], "Capacity"), "17179869184");
 }
 
-TEST_F(HostNamespaceTest, TheUuidIsThatOfDmidecodeWhateverTheVersion) {
+TEST_F(HostNamespaceTest, TheUuidEqualsThatOfDmidecodeForEveryVersion) {
   std::string const dmidecode = OutputOfCommand("PATH=$PATH:/usr/sbin:/sbin command -v dmidecode");
   NEEDS(!dmidecode.empty(), "dmidecode is not installed");
   std::string const table = TStructureMaker(1, 0x1b)
@@ -155,7 +155,7 @@ TEST_F(HostNamespaceTest, TheUuidIsThatOfDmidecodeWhateverTheVersion) {
   EXPECT_THAT(seen, ElementsAre("00112233-4455-6677-8899-aabbccddeeff", "33221100-5544-7766-8899-aabbccddeeff"));
 }
 
-TEST_F(HostNamespaceTest, ABareTablesUuidFollowsTheEntryPointBesideIt) {
+TEST_F(HostNamespaceTest, TheUuidOfABareTableFollowsTheEntryPointInItsDirectory) {
   std::string const table =
       TStructureMaker(1, 0x1b).Bytes(0x08, "\x33\x22\x11\x00\x55\x44\x77\x66\x88\x99\xaa\xbb\xcc\xdd\xee\xff"s).Table() +
       EndOfTable();
@@ -166,7 +166,7 @@ TEST_F(HostNamespaceTest, ABareTablesUuidFollowsTheEntryPointBesideIt) {
   EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "UUID"), "33221100-5544-7766-8899-AABBCCDDEEFF");
 }
 
-TEST_F(HostNamespaceTest, ClassesComeInAFixedOrder) {
+TEST_F(HostNamespaceTest, ClassesHaveAFixedOrder) {
   FillFromFile(SamplePath());
   std::vector<std::string> names;
   fNs->EnumerateClasses(
@@ -179,7 +179,7 @@ TEST_F(HostNamespaceTest, ClassesComeInAFixedOrder) {
                                  "CIM_Chassis", "CIM_Processor", "CIM_PhysicalMemory", "QRVSG_SCSIDevice", "ZEP_MissingValue"));
 }
 
-TEST_F(HostNamespaceTest, ADeclarationTellsKeyTypeAndSource) {
+TEST_F(HostNamespaceTest, ADeclarationHasKeyTypeAndSource) {
   FillFromFile(SamplePath());
   auto const cls = fNs->GetClass("QRVSG_ComputerSystem", TCIMContext());
   auto const source = [&](char const* property) {
@@ -209,14 +209,14 @@ TEST_F(HostNamespaceTest, EveryInstanceIsFoundByItsPath) {
         return true;
       },
       TCIMContext());
-  EXPECT_EQ(found, 18);  // 1 of each single class, 2 processors, 8 modules, 2 values and 1 class that are missing
+  EXPECT_EQ(found, 18);  // 1 of each single class, 2 processors, 8 modules, and 3 of ZEP_MissingValue
 }
 
-TEST_F(HostNamespaceTest, EachMissingValueOfAnInstanceSaysWhy) {
+TEST_F(HostNamespaceTest, EachMissingValueOfAnInstanceHasAReason) {
   FillFromFile(RealTablePath("no-serial"));
   EXPECT_THAT(MissingOf("QRVSG_ComputerSystem."),
-              UnorderedElementsAre("SerialNumber: the firmware gives no text", "UUID: the firmware gives none (all zeros)",
-                                   "SKUNumber: the firmware gives no text", "Family: the firmware gives no text"));
+              UnorderedElementsAre("SerialNumber: not given by the firmware", "UUID: the firmware gives none (all zeros)",
+                                   "SKUNumber: not given by the firmware", "Family: not given by the firmware"));
 }
 
 TEST_F(HostNamespaceTest, NothingIsNullWithoutAReason) {
@@ -234,7 +234,7 @@ TEST_F(HostNamespaceTest, NothingIsNullWithoutAReason) {
             },
             TCIMContext());
     auto const missing = InstancesOf("ZEP_MissingValue");
-    EXPECT_EQ(missing.size(), static_cast<std::size_t>(nulls) + 1);  // and no SCSI devices
+    EXPECT_EQ(missing.size(), static_cast<std::size_t>(nulls) + 1);  // the reason why there are no SCSI devices
     EXPECT_GT(nulls, 0);
     for (auto const& instance : missing) {
       EXPECT_NE(TextOf(*instance, "Reason"), "");
@@ -243,7 +243,7 @@ TEST_F(HostNamespaceTest, NothingIsNullWithoutAReason) {
   }
 }
 
-TEST_F(HostNamespaceTest, WithoutTablesTheMachineStillHasANameAndASystem) {
+TEST_F(HostNamespaceTest, WithoutTablesThereAreStillAMachineNameAndASystem) {
   FillFromFile(fDir.Path("nothing"));
   std::string const reason = "the SMBIOS table file " + fDir.Path("nothing") + " does not exist";
   EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "Name"), "db1");
@@ -264,11 +264,11 @@ TEST_F(HostNamespaceTest, EmptySocketsAndSlotsHaveNoInstance) {
   EXPECT_EQ(TextOfOnly("CIM_Processor", "Name"), "CPU 2");
   EXPECT_EQ(TextOfOnly("CIM_Processor", "DeviceID"), "Processor 0");
   EXPECT_THAT(InstancesOf("CIM_PhysicalMemory"), IsEmpty());
-  EXPECT_THAT(MissingOf("CIM_PhysicalMemory"), ElementsAre(": the firmware calls every memory slot empty"));
+  EXPECT_THAT(MissingOf("CIM_PhysicalMemory"), ElementsAre(": the firmware reports every memory slot as empty"));
   EXPECT_THAT(MissingOf("CIM_Chassis"), ElementsAre(": the SMBIOS tables hold no structure of type 3 (Chassis)"));
 }
 
-TEST_F(HostNamespaceTest, AKeyThatTheFirmwareDoesNotGiveIsLeftOutOfThePath) {
+TEST_F(HostNamespaceTest, AMissingKeyIsOmittedFromThePath) {
   std::string const bios = TStructureMaker(0, 0x18).Text(0x04, "Example Works").Table();
   Fill(bios + bios + EndOfTable());
   auto const instances = InstancesOf("CIM_BIOSElement");
@@ -279,7 +279,7 @@ TEST_F(HostNamespaceTest, AKeyThatTheFirmwareDoesNotGiveIsLeftOutOfThePath) {
   EXPECT_EQ(TextOf(*instances[1], "Version"), "NULL");
 }
 
-TEST_F(HostNamespaceTest, AMangledTableFillsANamespaceAllTheSame) {
+TEST_F(HostNamespaceTest, ADamagedTableStillFillsANamespace) {
   std::string const table = RealTable("full");
   for (std::size_t length = 0; length < table.size(); length += 7) {
     Fill(table.substr(0, length));
@@ -287,18 +287,18 @@ TEST_F(HostNamespaceTest, AMangledTableFillsANamespaceAllTheSame) {
   }
 }
 
-TEST_F(HostNamespaceTest, AHostNameThatNobodySetIsMissingEverywhere) {
+TEST_F(HostNamespaceTest, AHostNameThatIsNotSetIsMissingEverywhere) {
   TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", SamplePath().c_str());
   TEnvironmentGuard const name("ZEP_HOST_NAME", nullptr);
   TEnvironmentGuard const scsi("ZEP_SCSI_DEVICES", fScsiDevices.c_str());
   fNs = boost::make_shared<TMemoryNamespace>("root/test");
-  bool isNamedSo = false;
-  std::thread([&] {  // the name is that of this thread alone
-    isNamedSo = ::unshare(CLONE_NEWUTS) == 0 && ::sethostname("(none)", 6) == 0;
-    if (isNamedSo) FillHostNamespace(*fNs);
+  bool isNameSet = false;
+  std::thread([&] {  // only this thread gets the name
+    isNameSet = ::unshare(CLONE_NEWUTS) == 0 && ::sethostname("(none)", 6) == 0;
+    if (isNameSet) FillHostNamespace(*fNs);
   })
       .join();
-  NEEDS(isNamedSo, "only root may change the host name");
+  NEEDS(isNameSet, "only root may change the host name");
 
   std::string const reason = "placeholder text of the kernel: \"(none)\"; no host name is set";
   EXPECT_EQ(TextOfOnly("QRVSG_ComputerSystem", "Name"), "NULL");
@@ -324,7 +324,7 @@ TEST_F(HostNamespaceTest, ScsiDevicesAreThoseOfSysfs) {
   EXPECT_THAT(MissingOf("QRVSG_SCSIDevice"), IsEmpty());
 }
 
-TEST_F(HostNamespaceTest, WithoutScsiDevicesTheClassIsThereAndSaysWhyItIsEmpty) {
+TEST_F(HostNamespaceTest, WithoutScsiDevicesTheClassHasAReason) {
   FillFromFile(SamplePath());
   EXPECT_THAT(InstancesOf("QRVSG_SCSIDevice"), IsEmpty());
   EXPECT_THAT(MissingOf("QRVSG_SCSIDevice"),
@@ -337,7 +337,7 @@ TEST_F(HostNamespaceTest, WithoutScsiDevicesTheClassIsThereAndSaysWhyItIsEmpty) 
 
 // ---- The plug-in ----
 
-TEST_F(HostNamespaceTest, ThePlugInRegistersItselfAndReadsTheMachineWhenItIsAsked) {
+TEST_F(HostNamespaceTest, ThePlugInRegistersItselfAndReadsTheMachineAtTheFirstCall) {
   ASSERT_THAT(TOSSpecific::FindNSPs(), testing::Contains("Host"));
   TOSSpecific::LoadNSPLibrary("Host");
   auto const provider = TNamespaceProviderManager::GetInstance()->GetNamespaceProvider("Host");

@@ -24,7 +24,7 @@ VERSION="12 (bookworm)"
 ID=debian
 )os";
 
-TEST(OsReleaseTest, AssignmentsAreReadAsAShellReadsThem) {
+TEST(OsReleaseTest, AssignmentsAreReadAsByAShell) {
   struct TRow {
     char const* line;
     char const* value;
@@ -50,7 +50,7 @@ TEST(OsReleaseTest, AssignmentsAreReadAsAShellReadsThem) {
   }
 }
 
-TEST(OsReleaseTest, OtherLinesArePassedOverAndTheLastAssignmentCounts) {
+TEST(OsReleaseTest, OtherLinesAreIgnoredAndTheLastAssignmentCounts) {
   EXPECT_THAT(ParseOsRelease("# A=1\n   \nno assignment\nB=1\nB=2"), ElementsAre(Pair("B", "2")));
   EXPECT_THAT(ParseOsRelease(""), IsEmpty());
 }
@@ -59,16 +59,16 @@ TEST(OsReleaseTest, TheFirstNameWithAValueIsTaken) {
   TOsRelease const release("/etc/os-release", "VERSION=\nVERSION_ID=12\nBUILD_ID=rolling\n");
   EXPECT_EQ(*release.Value({"VERSION", "VERSION_ID", "BUILD_ID"}), "12");
   EXPECT_EQ(release.Value({"NAME", "ID"}).Why().fCode, "not-given");
-  EXPECT_EQ(release.Value({"NAME", "ID"}).Why().fReason, "/etc/os-release gives no NAME");
+  EXPECT_EQ(release.Value({"NAME", "ID"}).Why().fReason, "/etc/os-release contains no NAME");
 }
 
-TEST(OsReleaseTest, WithoutAFileEveryValueSaysSo) {
+TEST(OsReleaseTest, WithoutAFileEveryValueIsUnreadable) {
   TOsRelease const release("", "");
   EXPECT_EQ(release.Value({"NAME"}).Why().fCode, "unreadable");
   EXPECT_EQ(release.Value({"NAME"}).Why().fReason, "neither /etc/os-release nor /usr/lib/os-release can be read");
 }
 
-TEST(OsReleaseTest, ThisMachineHasAFileThatSaysItsName) {
+TEST(OsReleaseTest, ThisMachineHasAFileWithAName) {
   TOsRelease const release = TOsRelease::OfThisMachine();
   if (release.GetFile().empty()) GTEST_SKIP() << "this machine has no os-release file";
   auto const name = release.Value({"NAME"});
@@ -117,13 +117,13 @@ TEST(OsReleaseTest, TheOperatingSystemIsDescribedByItsFileAndItsKernel) {
   }
 }
 
-TEST(OsReleaseTest, ARollingSystemHasNoVersionButItsBuild) {
+TEST(OsReleaseTest, ASystemWithoutVersionHasItsBuildInstead) {
   auto const version = [](std::string const& text) {
     return PropertyOf(OperatingSystemRecord(TOsRelease("/etc/os-release", text), KernelOf("a"), {"a", "uname"}), "Version");
   };
   EXPECT_EQ(version("NAME=R\nBUILD_ID=rolling\n"), "string rolling");
   EXPECT_EQ(version("NAME=R\nVERSION_ID=39\nBUILD_ID=x\n"), "string 39");
-  EXPECT_EQ(version("NAME=R\n"), "string NULL not-given: /etc/os-release gives no VERSION");
+  EXPECT_EQ(version("NAME=R\n"), "string NULL not-given: /etc/os-release contains no VERSION");
 }
 
 TEST(OsReleaseTest, TheEnvironmentMayNameTheMachine) {
@@ -138,7 +138,7 @@ TEST(OsReleaseTest, TheEnvironmentMayNameTheMachine) {
   EXPECT_EQ(*SystemNameOf(KernelOf("(none)")).fName, "other") << "instead of a placeholder";
 }
 
-TEST(OsReleaseTest, TheCollectorTellsItsVersionAndBuild) {
+TEST(OsReleaseTest, TheCollectorReportsItsVersionAndBuild) {
   TRecord const record = ProductRecord();
   EXPECT_EQ(record.GetClassName(), "QRVSG_ZEPProduct");
   EXPECT_EQ(PropertyOf(record, "Name"), "string zepcore");

@@ -6,7 +6,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-TEST(PlaceholderTest, TextsThatStandForNoneAreKnown) {
+TEST(PlaceholderTest, PlaceholdersAreRecognised) {
   for (char const* text : {"To Be Filled By O.E.M.",
                            "to be filled by o.e.m.",
                            "Default string",
@@ -82,11 +82,11 @@ TEST(PlaceholderTest, APlaceholderOrBlankTextIsMissing) {
     auto const missing = WithoutPlaceholder(std::string(blank));
     ASSERT_FALSE(missing);
     EXPECT_EQ(missing.Why().fCode, "not-given");
-    EXPECT_EQ(missing.Why().fReason, "the firmware gives a blank text");
+    EXPECT_EQ(missing.Why().fReason, "blank in the firmware");
   }
 }
 
-TEST(PlaceholderTest, MemoryThatWasNeverWrittenIsNotProgrammed) {
+TEST(PlaceholderTest, UnwrittenFlashMemoryIsNotProgrammed) {
   for (char const* text : {"\xff", " \xff\xff\xff\n"}) {
     auto const missing = WithoutPlaceholder(std::string(text));
     ASSERT_FALSE(missing);
@@ -96,7 +96,7 @@ TEST(PlaceholderTest, MemoryThatWasNeverWrittenIsNotProgrammed) {
   EXPECT_TRUE(WithoutPlaceholder(std::string("A\xff")));
 }
 
-TEST(PlaceholderTest, TheKernelsNameForNoNameIsNoHostName) {
+TEST(PlaceholderTest, ThePlaceholderOfTheKernelIsNotAHostName) {
   auto const placeholder = HostNameOf("(none)");
   ASSERT_FALSE(placeholder);
   EXPECT_EQ(placeholder.Why().fCode, "placeholder");

@@ -5,7 +5,7 @@
 
 namespace NQRVZEP20 {
 
-// A directory of SCSI devices as sysfs has it.
+// A directory of SCSI devices in the form of sysfs.
 class TScsiDirectory {
 public:
   explicit TScsiDirectory(std::string path) : fPath(std::move(path)) { std::filesystem::create_directories(fPath); }

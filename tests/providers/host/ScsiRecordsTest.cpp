@@ -13,7 +13,7 @@ using testing::IsEmpty;
 
 class ScsiRecordsTest : public testing::Test {
 protected:
-  // "DeviceID|DeviceType|VendorID|ProductID|ProductRevision" of each record, with the reason for what is missing.
+  // "DeviceID|DeviceType|VendorID|ProductID|ProductRevision" of each record, or the reason for a missing value.
   std::vector<std::string> Records() const {
     std::vector<std::string> texts;
     for (TRecord const& record : ScsiRecords(fPath, {"db1", "uname"})) {
@@ -41,7 +41,7 @@ TEST_F(ScsiRecordsTest, DevicesComeInTheOrderOfTheirAddresses) {
                                      "10:0:0:0|Direct Access Device|V|M|R"));
 }
 
-TEST_F(ScsiRecordsTest, HostsAndTargetsAreNoDevices) {
+TEST_F(ScsiRecordsTest, HostsAndTargetsAreNotDevices) {
   for (char const* name : {"host0", "target0:0:0", "0:0:0", "0:0:0:0:0", "0:0:0:0x", "x0:0:0:0"})
     fDevices.Add(name, "0", "V", "M", "R");
   EXPECT_THAT(Records(), IsEmpty());
@@ -80,30 +80,30 @@ TEST_F(ScsiRecordsTest, EveryTypeHasItsName) {
   }
 }
 
-TEST_F(ScsiRecordsTest, TextsLoseTheBlanksTheyAreFilledUpWith) {
+TEST_F(ScsiRecordsTest, PaddingBlanksAreRemoved) {
   fDevices.Add("0:0:0:0", "5", "QEMU    ", "  QEMU CD-ROM   ", "2.5+");
   EXPECT_THAT(Records(), ElementsAre("0:0:0:0|CD-ROM Device|QEMU|QEMU CD-ROM|2.5+"));
 }
 
-TEST_F(ScsiRecordsTest, WhatADeviceDoesNotGiveSaysWhy) {
+TEST_F(ScsiRecordsTest, AMissingValueOfADeviceHasAReason) {
   fDevices.Add("0:0:0:0", "0", "        ", "M", "R");
   std::filesystem::remove(fPath + "/0:0:0:0/rev");
-  EXPECT_THAT(Records(), ElementsAre("0:0:0:0|Direct Access Device|<the device gives a blank text>|M|<" + fPath +
-                                     "/0:0:0:0/rev cannot be read>"));
+  EXPECT_THAT(Records(),
+              ElementsAre("0:0:0:0|Direct Access Device|<blank in the device>|M|<" + fPath + "/0:0:0:0/rev cannot be read>"));
 }
 
-TEST_F(ScsiRecordsTest, ADeviceThatGoesAwayMeanwhileIsLeftOut) {
+TEST_F(ScsiRecordsTest, ADeviceThatIsRemovedMeanwhileIsOmitted) {
   fDevices.Add("0:0:0:0", "0", "V", "M", "R");
   std::filesystem::create_directory_symlink("nowhere", fPath + "/1:0:0:0");
   EXPECT_THAT(Records(), ElementsAre("0:0:0:0|Direct Access Device|V|M|R"));
 }
 
-TEST_F(ScsiRecordsTest, WithoutTheDirectoryThereAreNone) {
+TEST_F(ScsiRecordsTest, WithoutTheDirectoryThereAreNoDevices) {
   std::filesystem::remove(fPath);
   EXPECT_THAT(Records(), IsEmpty());
 }
 
-TEST_F(ScsiRecordsTest, TheDirectoryIsTheKernelsUnlessATestSaysOtherwise) {
+TEST_F(ScsiRecordsTest, TheEnvironmentMayNameAnotherDirectory) {
   TEnvironmentGuard const named("ZEP_SCSI_DEVICES", fPath.c_str());
   EXPECT_EQ(ScsiDirectory(), fPath);
   TEnvironmentGuard const empty("ZEP_SCSI_DEVICES", "");

@@ -10,8 +10,8 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr char const* kTooShort = "NULL not-given: the firmware's structure ends before this field";
-constexpr char const* kUnknown = "NULL not-given: the firmware calls it unknown";
-constexpr char const* kNoText = "NULL not-given: the firmware gives no text";
+constexpr char const* kUnknown = "NULL not-given: the firmware reports it as unknown";
+constexpr char const* kNoText = "NULL not-given: not given by the firmware";
 
 struct TExpected {
   char const* property;
@@ -44,7 +44,7 @@ TRecord SystemRecordOf(TStructureMaker const& maker) {
   return ComputerSystemRecord(maker.Make(), "SMBIOS type 1", TSystemName{"db1", "uname"});
 }
 
-TEST(SystemRecordTest, EveryFieldHasItsPlace) {
+TEST(SystemRecordTest, EveryFieldIsReadAtItsOffset) {
   TRecord const record = SystemRecordOf(System()
                                             .Text(0x04, "Example Works")
                                             .Text(0x05, "Server Q100 -[1234AB7]-")
@@ -66,21 +66,21 @@ TEST(SystemRecordTest, EveryFieldHasItsPlace) {
                             {"Family", "string Server Q"}});
 }
 
-TEST(SystemRecordTest, TheNameAndTheTableHaveSourcesOfTheirOwn) {
+TEST(SystemRecordTest, TheNameAndTheTableHaveDifferentSources) {
   TRecord const record = SystemRecordOf(System());
   EXPECT_EQ(record.GetProperties()[0].fSource, "");
   EXPECT_EQ(record.GetProperties()[1].fSource, "uname");
   EXPECT_EQ(record.GetProperties()[2].fSource, "SMBIOS type 1");
 }
 
-TEST(SystemRecordTest, PlaceholdersAndWhatIsNotGivenAreNullForTheirReason) {
+TEST(SystemRecordTest, PlaceholdersAndMissingFieldsAreNullWithAReason) {
   TRecord const record = SystemRecordOf(System().Text(0x04, "System manufacturer").Text(0x05, " ").Byte(0x07, 9));
   ExpectProperties(
       record,
       {{"CreationClassName", "string QRVSG_ComputerSystem"},
        {"Name", "string db1"},
        {"Manufacturer", "string NULL placeholder: placeholder text of the firmware: \"System manufacturer\""},
-       {"ProductName", "string NULL not-given: the firmware gives a blank text"},
+       {"ProductName", "string NULL not-given: blank in the firmware"},
        {"Version", std::string("string ") + kNoText},
        {"SerialNumber", "string NULL unexpected-form: the firmware refers to string 9, which the structure does not contain"},
        {"UUID", "string NULL not-given: the firmware gives none (all zeros)"},
@@ -102,7 +102,7 @@ TEST(SystemRecordTest, TheVersionDecidesTheByteOrderOfTheUuid) {
   EXPECT_EQ(uuid(std::nullopt), turned) << "unknown";
 }
 
-TEST(SystemRecordTest, AUuidThatNobodySetIsNull) {
+TEST(SystemRecordTest, AUuidThatIsNotSetIsNull) {
   EXPECT_EQ(PropertyOf(SystemRecordOf(System().Bytes(0x08, std::string(16, '\xff'))), "UUID"),
             "string NULL not-given: not set by the firmware (all ones)");
   std::string const counted = "\x00\x02\x00\x03\x00\x04\x00\x05\x00\x06\x00\x07\x00\x08\x00\x09"s;
@@ -121,7 +121,7 @@ TEST(SystemRecordTest, AnOldStructureHasFewerFields) {
 
 TStructureMaker Bios() { return TStructureMaker(0, 0x1a); }
 
-TEST(BiosRecordTest, EveryFieldHasItsPlace) {
+TEST(BiosRecordTest, EveryFieldIsReadAtItsOffset) {
   TRecord const record = BiosRecord(
       Bios().Text(0x04, "Example Works").Text(0x05, "-[QAE118B-1.30]-").Word(0x06, 0xf000).Text(0x08, "03/14/2024").Make(),
       "SMBIOS type 0", 0);
@@ -159,7 +159,7 @@ TEST(BiosRecordTest, DatesAreReadInBothForms) {
         << row.text;
 }
 
-TEST(BiosRecordTest, WhatIsNoDateSaysSo) {
+TEST(BiosRecordTest, AnInvalidDateHasAReason) {
   for (std::string const text :
        {"2024-03-14", "3/14/2024", "13/01/2024", "00/10/2024", "02/30/2024", "02/29/2023", "02/29/1900", "04/31/2024",
         "01/00/2024", "01/32/2024", "03/14/20245", "March 2024", "aa/bb/cccc", "03/14/2024 "})
@@ -172,7 +172,7 @@ TEST(BiosRecordTest, WhatIsNoDateSaysSo) {
 
 TStructureMaker Chassis() { return TStructureMaker(3, 0x16); }
 
-TEST(ChassisRecordTest, EveryFieldHasItsPlace) {
+TEST(ChassisRecordTest, EveryFieldIsReadAtItsOffset) {
   TRecord const record = ChassisRecord(Chassis()
                                            .Text(0x04, "Example Works")
                                            .Byte(0x05, 23)
@@ -224,7 +224,7 @@ TEST(ChassisRecordTest, TypesHaveTheNumbersAndNamesOfCim) {
   }
 }
 
-TEST(ChassisRecordTest, AnUnknownTypeIsNullAndOneOutOfRangeNotOfTheExpectedForm) {
+TEST(ChassisRecordTest, AnUnknownTypeIsNullAndATypeOutOfRangeIsUnexpected) {
   EXPECT_EQ(PropertyOf(ChassisRecord(Chassis().Byte(0x05, 2).Make(), "", 0), "ChassisPackageType"),
             std::string("uint16 ") + kUnknown);
   for (int type : {0, 37, 127, 0x80 | 37})
@@ -238,11 +238,11 @@ TEST(ChassisRecordTest, UnspecifiedHeightAndCordsAreNull) {
   EXPECT_EQ(PropertyOf(record, "NumberOfPowerCords"), std::string("uint16 ") + kUnknown);
 }
 
-TEST(ChassisRecordTest, TheSkuStandsBehindTheContainedElements) {
+TEST(ChassisRecordTest, TheSkuFollowsTheContainedElements) {
   EXPECT_EQ(
       PropertyOf(ChassisRecord(TStructureMaker(3, 0x1c).Byte(0x13, 2).Byte(0x14, 3).Text(0x1b, "SKU-9").Make(), "", 0), "SKU"),
       "string SKU-9");
-  // 255 elements of 255 bytes lie far behind the structure's end.
+  // 255 elements of 255 bytes end far after the end of the structure.
   EXPECT_EQ(PropertyOf(ChassisRecord(Chassis().Byte(0x13, 255).Byte(0x14, 255).Make(), "", 0), "SKU"),
             std::string("string ") + kTooShort);
   EXPECT_EQ(PropertyOf(ChassisRecord(TStructureMaker(3, 0x0d).Make(), "", 0), "SKU"), std::string("string ") + kTooShort);
@@ -256,7 +256,7 @@ TRecord ProcessorRecordOf(TStructureMaker const& maker) {
   return ProcessorRecord(maker.Make(), "SMBIOS type 4", 1, TSystemName{"db1", "uname"});
 }
 
-TEST(ProcessorRecordTest, EveryFieldHasItsPlace) {
+TEST(ProcessorRecordTest, EveryFieldIsReadAtItsOffset) {
   TRecord const record = ProcessorRecordOf(Processor()
                                                .Text(0x04, "CPU 1")
                                                .Byte(0x05, 3)
@@ -290,7 +290,7 @@ TEST(ProcessorRecordTest, EveryFieldHasItsPlace) {
                             {"NumberOfEnabledCores", "uint16 12"}});
 }
 
-TEST(ProcessorRecordTest, WhatTheFirmwareCallsUnknownIsNull) {
+TEST(ProcessorRecordTest, FieldsThatAreUnknownToTheFirmwareAreNull) {
   TRecord const record = ProcessorRecordOf(Processor().Byte(0x05, 2).Byte(0x06, 2).Byte(0x19, 2).Word(0x26, 0x0002));
   for (char const* property : {"Family", "UpgradeMethod", "CPUStatus", "DataWidth", "NumberOfEnabledCores"})
     EXPECT_EQ(PropertyOf(record, property), std::string("uint16 ") + kUnknown) << property;
@@ -300,7 +300,7 @@ TEST(ProcessorRecordTest, WhatTheFirmwareCallsUnknownIsNull) {
   EXPECT_EQ(PropertyOf(record, "UniqueID"), "string NULL not-given: the firmware gives none (all zeros)");
 }
 
-TEST(ProcessorRecordTest, WideFieldsTakeOverWhereTheNarrowOnesSaySo) {
+TEST(ProcessorRecordTest, NarrowFieldsMayReferToWideFields) {
   struct TRow {
     char const* what;
     TStructureMaker maker;
@@ -325,7 +325,7 @@ TEST(ProcessorRecordTest, FieldsOfNewerVersionsAreMissingInOldStructures) {
   EXPECT_EQ(PropertyOf(record, "NumberOfEnabledCores"), std::string("uint16 ") + kTooShort);
 }
 
-TEST(ProcessorRecordTest, ARoleOutOfRangeIsNotOfTheExpectedForm) {
+TEST(ProcessorRecordTest, ARoleOutOfRangeIsUnexpected) {
   EXPECT_EQ(PropertyOf(ProcessorRecordOf(Processor().Byte(0x05, 6)), "Role"), "string Video Processor");
   EXPECT_EQ(PropertyOf(ProcessorRecordOf(Processor().Byte(0x05, 7)), "Role"),
             "string NULL unexpected-form: not in the expected form: processor type 7");
@@ -333,7 +333,7 @@ TEST(ProcessorRecordTest, ARoleOutOfRangeIsNotOfTheExpectedForm) {
             "string NULL unexpected-form: not in the expected form: processor type 0");
 }
 
-TEST(ProcessorRecordTest, EmptySocketsAreToldApart) {
+TEST(ProcessorRecordTest, EmptySocketsAreRecognised) {
   EXPECT_TRUE(IsSocketFilled(Processor().Byte(0x18, 0x41).Make()));
   EXPECT_FALSE(IsSocketFilled(Processor().Byte(0x18, 0x00).Make()));
   EXPECT_TRUE(IsSocketFilled(TStructureMaker(4, 0x10).Make())) << "says nothing of it";
@@ -347,7 +347,7 @@ std::string ModuleProperty(TStructureMaker const& maker, char const* property) {
   return PropertyOf(MemoryRecord(maker.Make(), "SMBIOS type 17", 0), property);
 }
 
-TEST(MemoryRecordTest, EveryFieldHasItsPlace) {
+TEST(MemoryRecordTest, EveryFieldIsReadAtItsOffset) {
   TRecord const record = MemoryRecord(Module()
                                           .Word(0x08, 72)
                                           .Word(0x0a, 64)
@@ -384,7 +384,7 @@ TEST(MemoryRecordTest, EveryFieldHasItsPlace) {
                             {"ConfiguredMemoryClockSpeed", "uint32 2933"}});
 }
 
-TEST(MemoryRecordTest, CapacityIsInBytesWhateverTheUnit) {
+TEST(MemoryRecordTest, CapacityIsConvertedToBytes) {
   struct TRow {
     char const* what;
     TStructureMaker maker;
@@ -402,7 +402,7 @@ TEST(MemoryRecordTest, CapacityIsInBytesWhateverTheUnit) {
   for (TRow const& row : rows) EXPECT_EQ(ModuleProperty(row.maker, "Capacity"), "uint64 " + row.value) << row.what;
 }
 
-TEST(MemoryRecordTest, SpeedsBeyondTheFieldAreExtended) {
+TEST(MemoryRecordTest, GreatSpeedsAreReadFromTheExtendedField) {
   struct TRow {
     char const* what;
     TStructureMaker maker;
@@ -445,7 +445,7 @@ TEST(MemoryRecordTest, UnknownWidthsAreNull) {
   EXPECT_EQ(ModuleProperty(Module().Word(0x0a, 0xffff), "DataWidth"), std::string("uint16 ") + kUnknown);
 }
 
-TEST(MemoryRecordTest, EmptySlotsAreToldApart) {
+TEST(MemoryRecordTest, EmptySlotsAreRecognised) {
   EXPECT_TRUE(IsSlotFilled(Module().Word(0x0c, 512).Make()));
   EXPECT_TRUE(IsSlotFilled(Module().Word(0x0c, 0xffff).Make())) << "of unknown size";
   EXPECT_FALSE(IsSlotFilled(Module().Make()));
@@ -453,7 +453,7 @@ TEST(MemoryRecordTest, EmptySlotsAreToldApart) {
 
 // ---- All ----
 
-// A class is declared from any record of it, so names, types, keys and order must not depend on the bytes.
+// Any record can declare its class, so names, types, keys and order must not depend on the bytes.
 TEST(SmbiosRecordsTest, EveryRecordOfAClassHasTheSameShape) {
   TSmbiosStructure const absent(TMissing{kMissingNoTables, "none"});
   TSystemName const name{"db1", "uname"};
@@ -477,8 +477,8 @@ TEST(SmbiosRecordsTest, EveryRecordOfAClassHasTheSameShape) {
   }
 }
 
-// Every structure of the real tables, cut at every length, with every byte of the formatted area set to the ends of its range.
-TEST(SmbiosRecordsTest, NoBytesLeadOutsideAStructure) {
+// Every structure of the real tables, cut at every length, with every byte of the formatted area set to 0x00 and to 0xFF.
+TEST(SmbiosRecordsTest, NothingIsReadOutsideAStructure) {
   TSystemName const name{"db1", "uname"};
   auto const readAll = [&](std::string const& bytes) {
     TSmbiosStructure const structure(std::vector<unsigned char>(bytes.begin(), bytes.end()));

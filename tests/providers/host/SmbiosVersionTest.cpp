@@ -13,7 +13,7 @@ std::string VersionText(std::optional<TSmbiosVersion> const& version) {
   return version ? std::to_string(version->first) + "." + std::to_string(version->second) : "none";
 }
 
-TEST(SmbiosVersionTest, IsThatOfTheEntryPointWhateverItsForm) {
+TEST(SmbiosVersionTest, EveryFormOfEntryPointHasItsVersion) {
   struct TRow {
     std::string entryPoint;
     char const* version;
@@ -33,13 +33,13 @@ TEST(SmbiosVersionTest, IsThatOfTheEntryPointWhateverItsForm) {
   }
 }
 
-TEST(SmbiosVersionTest, VersionsThatThereAreNoneOfAreCorrected) {
+TEST(SmbiosVersionTest, VersionsThatDoNotExistAreCorrected) {
   EXPECT_EQ(VersionText(VersionInEntryPoint(EntryPoint32(100, 32, 0x1F, 0x21F))), "2.3");
   EXPECT_EQ(VersionText(VersionInEntryPoint(EntryPoint32(100, 32, 0x1F, 0x221))), "2.3");
   EXPECT_EQ(VersionText(VersionInEntryPoint(EntryPoint32(100, 32, 0x1F, 0x233))), "2.6");
 }
 
-TEST(SmbiosVersionTest, ADamagedEntryPointHasNone) {
+TEST(SmbiosVersionTest, ADamagedEntryPointHasNoVersion) {
   for (std::string const& sound :
        {EntryPoint32(100).substr(0, 0x1F), EntryPoint64(100).substr(0, 0x18), EntryPointLegacy(100).substr(0, 0x0F)}) {
     ASSERT_NE(VersionText(VersionInEntryPoint(sound)), "none");
@@ -65,12 +65,12 @@ protected:
   TTempDir fDir;
 };
 
-TEST_F(VersionOfTablesTest, ADumpBeginsWithIt) {
+TEST_F(VersionOfTablesTest, ADumpBeginsWithItsEntryPoint) {
   WriteFile(fDir.Path("smbios_entry_point"), EntryPoint64(100));
   EXPECT_EQ(VersionOf(EntryPoint32(100, 32, 0x1F, 0x204) + RealTable("full")), "2.4") << "not the file beside it";
 }
 
-TEST_F(VersionOfTablesTest, ABareTableHasItBesideIt) {
+TEST_F(VersionOfTablesTest, TheEntryPointOfABareTableIsInItsDirectory) {
   EXPECT_EQ(VersionOf(RealTable("full")), "none");
   WriteFile(fDir.Path("smbios_entry_point"), EntryPoint32(100, 32, 0x1F, 0x204).substr(0, 0x1F));
   EXPECT_EQ(VersionOf(RealTable("full")), "2.4");
@@ -80,12 +80,12 @@ TEST_F(VersionOfTablesTest, ABareTableHasItBesideIt) {
   EXPECT_EQ(VersionOf(RealTable("full")), "none");
 }
 
-TEST_F(VersionOfTablesTest, APipeInItsPlaceIsNotWaitedFor) {
+TEST_F(VersionOfTablesTest, APipeDoesNotBlock) {
   ASSERT_EQ(::mkfifo(fDir.Path("smbios_entry_point").c_str(), 0600), 0);
   EXPECT_EQ(VersionOf(RealTable("full")), "none");
 }
 
-TEST_F(VersionOfTablesTest, TheRealTablesHaveThoseOfTheirMachines) {
+TEST_F(VersionOfTablesTest, TheRealTablesHaveTheVersionsOfTheirMachines) {
   for (std::string const& name : kRealTables)
     EXPECT_EQ(VersionText(VersionOfTables(RealTablePath(name))), name == "entry64" ? "3.0" : "2.8") << name;
   EXPECT_EQ(VersionText(VersionOfTables(SamplePath())), "3.3");

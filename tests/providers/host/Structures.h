@@ -11,10 +11,10 @@
 
 namespace NQRVZEP20 {
 
-// A structure in the making. Offsets are the standard's: they count from the header.
+// Makes a structure. Offsets count from the header, as in the standard.
 class TStructureMaker {
 public:
-  // `size` of header and formatted area; what is not set is 0.
+  // `size`: of header and formatted area. A field that is not set is 0.
   TStructureMaker(int type, std::size_t size) : fType(type), fFields(size - 4, '\0') {}
 
   TStructureMaker& Byte(std::size_t offset, unsigned number) { return Put(offset, number, 1); }
@@ -25,7 +25,7 @@ public:
     return *this;
   }
 
-  // A text field: the next string of the set.
+  // A string field: adds a string to the set and refers to it.
   TStructureMaker& Text(std::size_t offset, std::string const& text) {
     fStrings.push_back(text);
     return Byte(offset, static_cast<unsigned>(fStrings.size()));

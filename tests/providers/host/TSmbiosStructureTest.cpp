@@ -14,7 +14,7 @@ TSmbiosStructure StructureOf(std::string const& bytes) {
 
 // The value, or "code: reason".
 template <class T>
-std::string Said(TFinding<T> const& finding) {
+std::string ResultOf(TFinding<T> const& finding) {
   if (!finding) return finding.Why().fCode + ": " + finding.Why().fReason;
   if constexpr (std::is_same_v<T, std::string>)
     return *finding;
@@ -26,19 +26,19 @@ constexpr char const* kTooShort = "not-given: the firmware's structure ends befo
 
 TEST(TSmbiosStructureTest, NumbersAreLittleEndian) {
   TSmbiosStructure const structure = StructureOf("\x01\x08\x02\x03\x12\x34\x56\xff\0\0"s);
-  EXPECT_EQ(Said(structure.Byte(4)), "18");
-  EXPECT_EQ(Said(structure.Word(4)), std::to_string(0x3412));
-  EXPECT_EQ(Said(structure.DWord(4)), std::to_string(0xff563412u));
+  EXPECT_EQ(ResultOf(structure.Byte(4)), "18");
+  EXPECT_EQ(ResultOf(structure.Word(4)), std::to_string(0x3412));
+  EXPECT_EQ(ResultOf(structure.DWord(4)), std::to_string(0xff563412u));
 }
 
-TEST(TSmbiosStructureTest, FieldsBehindTheFormattedAreaAreMissing) {
+TEST(TSmbiosStructureTest, FieldsAfterTheFormattedAreaAreMissing) {
   TSmbiosStructure const structure = StructureOf("\x01\x08\x02\x03\x12\x34\x56\xfftext\0\0"s);
-  EXPECT_EQ(Said(structure.Byte(7)), "255");
-  EXPECT_EQ(Said(structure.Byte(8)), kTooShort);
-  EXPECT_EQ(Said(structure.Word(6)), std::to_string(0xff56));
-  EXPECT_EQ(Said(structure.Word(7)), kTooShort);
-  EXPECT_EQ(Said(structure.DWord(5)), kTooShort);
-  EXPECT_EQ(Said(structure.Text(8)), kTooShort);
+  EXPECT_EQ(ResultOf(structure.Byte(7)), "255");
+  EXPECT_EQ(ResultOf(structure.Byte(8)), kTooShort);
+  EXPECT_EQ(ResultOf(structure.Word(6)), std::to_string(0xff56));
+  EXPECT_EQ(ResultOf(structure.Word(7)), kTooShort);
+  EXPECT_EQ(ResultOf(structure.DWord(5)), kTooShort);
+  EXPECT_EQ(ResultOf(structure.Text(8)), kTooShort);
   EXPECT_TRUE(structure.Bytes(4, 4));
   EXPECT_FALSE(structure.Bytes(4, 5));
 }
@@ -57,26 +57,26 @@ TEST(TSmbiosStructureTest, NothingOutsideTheBytesIsRead) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);
     TSmbiosStructure const structure = StructureOf(row.bytes);
-    EXPECT_EQ(Said(structure.Byte(0x07)), kTooShort);
-    EXPECT_EQ(Said(structure.DWord(0x17)), kTooShort);
+    EXPECT_EQ(ResultOf(structure.Byte(0x07)), kTooShort);
+    EXPECT_EQ(ResultOf(structure.DWord(0x17)), kTooShort);
     EXPECT_FALSE(structure.Text(0x04)) << *structure.Text(0x04);
-    EXPECT_EQ(Said(structure.Byte(static_cast<std::size_t>(-1) / 2)), kTooShort);
+    EXPECT_EQ(ResultOf(structure.Byte(static_cast<std::size_t>(-1) / 2)), kTooShort);
   }
 }
 
-TEST(TSmbiosStructureTest, TextsAreCountedFromOne) {
+TEST(TSmbiosStructureTest, StringsAreCountedFromOne) {
   TSmbiosStructure const structure = StructureOf("\x01\x08\0\0\1\2\3\0"s + "first\0second\0third\0\0"s);
-  EXPECT_EQ(Said(structure.Text(4)), "first");
-  EXPECT_EQ(Said(structure.Text(5)), "second");
-  EXPECT_EQ(Said(structure.Text(6)), "third");
-  EXPECT_EQ(Said(structure.Text(7)), "not-given: the firmware gives no text");
+  EXPECT_EQ(ResultOf(structure.Text(4)), "first");
+  EXPECT_EQ(ResultOf(structure.Text(5)), "second");
+  EXPECT_EQ(ResultOf(structure.Text(6)), "third");
+  EXPECT_EQ(ResultOf(structure.Text(7)), "not-given: not given by the firmware");
 }
 
-TEST(TSmbiosStructureTest, TextsThatAreNotThereAreMissing) {
+TEST(TSmbiosStructureTest, AStringThatTheStructureDoesNotContainIsMissing) {
   struct TRow {
     char const* what;
     std::string strings;
-    bool isThere;
+    bool isPresent;
   } const rows[] = {
       {"fewer texts than the number", "first\0\0"s, false},
       {"no text at all", "\0\0"s, false},
@@ -88,22 +88,23 @@ TEST(TSmbiosStructureTest, TextsThatAreNotThereAreMissing) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);
     TSmbiosStructure const structure = StructureOf("\x01\x05\0\0\2"s + row.strings);
-    EXPECT_EQ(Said(structure.Text(4)),
-              row.isThere ? "second" : "unexpected-form: the firmware refers to string 2, which the structure does not contain");
+    EXPECT_EQ(
+        ResultOf(structure.Text(4)),
+        row.isPresent ? "second" : "unexpected-form: the firmware refers to string 2, which the structure does not contain");
   }
 }
 
-TEST(TSmbiosStructureTest, TextIsAsTheFirmwareWroteIt) {
+TEST(TSmbiosStructureTest, AStringIsVerbatim) {
   TSmbiosStructure const structure = StructureOf("\x01\x05\0\0\1 \x1b[31m\xff Q \0\0"s);
-  EXPECT_EQ(Said(structure.Text(4)), " \x1b[31m\xff Q ");
+  EXPECT_EQ(ResultOf(structure.Text(4)), " \x1b[31m\xff Q ");
 }
 
-TEST(TSmbiosStructureTest, EveryFieldOfAnAbsentStructureSaysWhyItIsAbsent) {
+TEST(TSmbiosStructureTest, EveryFieldOfAMissingStructureHasItsReason) {
   TSmbiosStructure const structure(TMissing{kMissingNeedsRoot, "needs root"});
-  EXPECT_EQ(Said(structure.Byte(0)), "needs-root: needs root");
-  EXPECT_EQ(Said(structure.Word(4)), "needs-root: needs root");
-  EXPECT_EQ(Said(structure.DWord(4)), "needs-root: needs root");
-  EXPECT_EQ(Said(structure.Text(4)), "needs-root: needs root");
+  EXPECT_EQ(ResultOf(structure.Byte(0)), "needs-root: needs root");
+  EXPECT_EQ(ResultOf(structure.Word(4)), "needs-root: needs root");
+  EXPECT_EQ(ResultOf(structure.DWord(4)), "needs-root: needs root");
+  EXPECT_EQ(ResultOf(structure.Text(4)), "needs-root: needs root");
   EXPECT_EQ(structure.Bytes(4, 1).Why().fCode, kMissingNeedsRoot);
 }
 

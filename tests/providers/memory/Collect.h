@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// What the tests of the memory namespace share: enumerations as lists of names.
+// Enumerations as lists of elements and names, for tests of namespaces.
 
 #include "ICIMClass.h"
 #include "ICIMInstance.h"

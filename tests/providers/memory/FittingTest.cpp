@@ -8,11 +8,11 @@
 namespace NQRVZEP20 {
 namespace {
 
-TEST(FittingTest, IntegerTakesTheDeclaredTypeWhenTheNumberFits) {
+TEST(FittingTest, IntegerIsConvertedToTheDeclaredTypeWhenTheNumberFits) {
   struct {
     char const* declared;
     TCIMValue given;
-    char const* fitted;  // its text; null when the value comes back as it was
+    char const* fitted;  // its text; null when the value is returned unchanged
   } const rows[] = {
       {"uint8", TCIMValue(255), "255"},
       {"uint8", TCIMValue(256), nullptr},
@@ -54,7 +54,7 @@ TEST(FittingTest, IntegerTakesTheDeclaredTypeWhenTheNumberFits) {
   }
 }
 
-TEST(FittingTest, ValueOfNoTypeBecomesANullOfTheDeclaredOne) {
+TEST(FittingTest, ValueWithoutTypeBecomesANullOfTheDeclaredType) {
   for (char const* type : {"boolean", "uint8", "string", "datetime", "reference", "string[]", "uint8[16]"}) {
     SCOPED_TRACE(type);
     TCIMValue const null = TMemoryType(type).GetNull();
@@ -65,7 +65,7 @@ TEST(FittingTest, ValueOfNoTypeBecomesANullOfTheDeclaredOne) {
   }
 }
 
-TEST(FittingTest, NullOfAnotherTypeStaysWhatItIs) {
+TEST(FittingTest, NullOfAnotherTypeIsUnchanged) {
   EXPECT_EQ(FittedTo(TMemoryType("uint8").GetNull(), TMemoryType("uint16").GetNull()).GetType(), 4);
 }
 

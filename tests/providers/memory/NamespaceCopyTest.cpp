@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// That the interfaces tell enough: a copy that is made through them alone equals its source.
+// A copy that is made only through the interfaces equals its source.
 
 #include "Collect.h"
 #include "ICIMQualifierDecl.h"
@@ -10,7 +10,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-// ---- A namespace as text, one line for each thing that it knows ----
+// ---- A namespace as text, one line for each element ----
 
 std::string TextOf(TCIMValue const& value) {
   std::string text = std::to_string(value.GetType()) + "/" + std::to_string(value.GetMaxArraySize());
@@ -117,7 +117,7 @@ void CopyClass(ICIMClass const& from, boost::shared_ptr<ICIMNamespace> ns) {
 
   to->BeginDeclarations(kNone);
   for (auto const& property : All(from, &ICIMClass::EnumeratePropertyDecls)) {
-    auto const declared = to->GetPropertyDecl(property->GetName(kNone), kNone);  // may be a superclass's, must not throw
+    auto const declared = to->GetPropertyDecl(property->GetName(kNone), kNone);  // may belong to a superclass; must not throw
     auto const copy = to->AddPropertyDecl(property->GetName(kNone), CopyOf(property->GetDefaultValue(kNone), ns), kNone);
     EXPECT_NE(copy, declared);
     CopyQualifiers(*property, *copy, *ns);
@@ -137,7 +137,7 @@ void CopyInstance(ICIMInstance const& from, boost::shared_ptr<ICIMNamespace> ns)
   cls->CommitInstance(to, kNone);
 }
 
-// The classes in two passes, associations in the second; then the instances, those of root classes with all below.
+// The classes in two passes, associations in the second; then the instances of the root classes and of all classes below.
 void CopyNamespace(ICIMNamespace const& from, boost::shared_ptr<ICIMNamespace> to) {
   for (auto const& decl : All(from, &ICIMNamespace::EnumerateQualifierDecls))
     to->CreateQualifierDecl(decl->GetName(kNone), decl->GetDefaultValue(kNone), decl->GetScope(kNone), decl->GetFlavor(kNone),
@@ -184,7 +184,7 @@ boost::shared_ptr<TMemoryNamespace> NewSource() {
     ns->DefineClass(name, superClass).Property("Depth" + std::to_string(depth), "sint64", -depth);
     superClass = name;
   }
-  ns->DefineClass("X_Plain");  // before the associations, which a copy makes last
+  ns->DefineClass("X_Plain");  // before the associations, which a copy creates last
   auto link = ns->DefineClass("X_Link").Association().KeyReference("From", "X_Device").KeyReference("To", "X_Device");
   link.Class()
       ->AddMethodDecl("Move", TType::kCIMTypeBoolean, kNone)
@@ -204,7 +204,7 @@ boost::shared_ptr<TMemoryNamespace> NewSource() {
   return ns;
 }
 
-TEST(NamespaceCopyTest, TextOfTheSourceTellsOfEverything) {
+TEST(NamespaceCopyTest, TheTextOfANamespaceContainsEverything) {
   std::string const text = Dump(*NewSource());
   for (char const* line : {
            "qualifier Key 1/0 'false' scope 24 flavor 2\n",
@@ -234,7 +234,7 @@ TEST(NamespaceCopyTest, CopyThroughTheInterfacesEqualsItsSource) {
   CopyNamespace(*source, copy);
   EXPECT_EQ(Dump(*copy), text);
 
-  source.reset();  // nothing of it is left in the copy
+  source.reset();  // the copy must not depend on it
   EXPECT_EQ(Dump(*copy), text);
 }
 

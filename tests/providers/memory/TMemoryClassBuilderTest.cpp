@@ -22,7 +22,7 @@ protected:
   boost::shared_ptr<TMemoryNamespace> const fNs = NewNamespace();
 };
 
-TEST_F(TMemoryClassBuilderTest, DescribesPropertiesInTheirOrder) {
+TEST_F(TMemoryClassBuilderTest, PropertiesAreDescribedInTheirOrder) {
   auto const cls = fNs->DefineClass("X_Disk")
                        .Key("Id", "uint32")
                        .Property("Name", "string")
@@ -39,7 +39,7 @@ TEST_F(TMemoryClassBuilderTest, DescribesPropertiesInTheirOrder) {
   EXPECT_EQ(cls->GetPropertyDecl("Tags", kNone)->GetDefaultValue(kNone).ToString(), "{ a }");
 }
 
-TEST_F(TMemoryClassBuilderTest, DescribesReferencesToClassesOneselfIncluded) {
+TEST_F(TMemoryClassBuilderTest, ReferencesToOtherClassesAndToTheClassItselfAreDescribed) {
   auto const disk = fNs->DefineClass("X_Disk").Class();
   auto const link = fNs->DefineClass("X_Link").Association().KeyReference("Disk", "X_Disk").Reference("Other", "x_link").Class();
   EXPECT_TRUE(link->GetClassFlag(kNone));
@@ -50,7 +50,7 @@ TEST_F(TMemoryClassBuilderTest, DescribesReferencesToClassesOneselfIncluded) {
   EXPECT_EQ(link->GetPropertyDecl("Other", kNone)->GetDefaultValue(kNone).GetReferencedClass(), link);
 }
 
-TEST_F(TMemoryClassBuilderTest, DescribesStaticProperties) {
+TEST_F(TMemoryClassBuilderTest, StaticPropertiesAreDescribed) {
   auto const cls = fNs->DefineClass("X_Disk").Static("Count", "uint16", 3).Class();
   auto const count = All(*cls, &ICIMClass::EnumerateStaticProperties).front();
   EXPECT_EQ(count->GetName(kNone), "Count");
@@ -59,7 +59,7 @@ TEST_F(TMemoryClassBuilderTest, DescribesStaticProperties) {
   EXPECT_EQ(Qualifiers(*cls->GetPropertyDecl("Count", kNone)), "Static(true)");
 }
 
-TEST_F(TMemoryClassBuilderTest, DescribesMethodsAndTheirParameters) {
+TEST_F(TMemoryClassBuilderTest, MethodsAndTheirParametersAreDescribed) {
   auto const cls = fNs->DefineClass("X_Disk")
                        .Method("Reset", "uint32")
                        .In("Force", "boolean")
@@ -78,7 +78,7 @@ TEST_F(TMemoryClassBuilderTest, DescribesMethodsAndTheirParameters) {
   EXPECT_THAT(Names(*methods[1], &ICIMMethodDecl::EnumerateParameterDecls), IsEmpty());
 }
 
-TEST_F(TMemoryClassBuilderTest, QualifierIsWrittenOnWhatWasDescribedLast) {
+TEST_F(TMemoryClassBuilderTest, QualifierBelongsToTheElementDescribedLast) {
   fNs->DefineClass("X_Device").Property("State", "uint16");
   auto const cls = fNs->DefineClass("X_Disk", "X_Device")
                        .Abstract()
@@ -111,7 +111,7 @@ TEST_F(TMemoryClassBuilderTest, QualifierHasItsDeclaredFlavor) {
             ICIMQualifierDecl::kFlavorDefault | ICIMQualifierDecl::kFlavorTranslatable);
 }
 
-TEST_F(TMemoryClassBuilderTest, RefusalIsNamedInTheLogAndWhatWasDescribedStays) {
+TEST_F(TMemoryClassBuilderTest, RefusalIsLoggedAndEarlierElementsRemain) {
   struct {
     std::function<void(TMemoryClassBuilder&)> action;
     EZEPStatusCode status;

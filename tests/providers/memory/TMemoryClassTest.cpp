@@ -24,9 +24,9 @@ protected:
   boost::shared_ptr<ICIMClass> const fSsd = Create("X_Ssd", fDisk);
 };
 
-// ---- What it is ----
+// ---- Properties of a class ----
 
-TEST_F(TMemoryClassTest, KnowsItsNamespaceAndSuperclass) {
+TEST_F(TMemoryClassTest, ClassHasItsNamespaceAndSuperclass) {
   EXPECT_EQ(fSsd->GetName(kNone), "X_Ssd");
   EXPECT_EQ(fSsd->GetNamespace(kNone), fNs);
   EXPECT_EQ(fSsd->GetSuperClass(kNone), fDisk);
@@ -35,7 +35,7 @@ TEST_F(TMemoryClassTest, KnowsItsNamespaceAndSuperclass) {
   EXPECT_FALSE(fDevice->GetSuperClass(kNone));
 }
 
-TEST_F(TMemoryClassTest, AssociationIsHandedDown) {
+TEST_F(TMemoryClassTest, AssociationIsInherited) {
   EXPECT_FALSE(fSsd->GetClassFlag(kNone));
   Qualify(*fDisk, "Association", true);
   EXPECT_FALSE(fDevice->GetClassFlag(kNone));
@@ -43,14 +43,14 @@ TEST_F(TMemoryClassTest, AssociationIsHandedDown) {
   EXPECT_TRUE(fSsd->GetClassFlag(kNone));
 }
 
-TEST_F(TMemoryClassTest, AbstractIsNotHandedDown) {
+TEST_F(TMemoryClassTest, AbstractIsNotInherited) {
   EXPECT_FALSE(fDisk->IsAbstract(kNone));
   Qualify(*fDisk, "Abstract", true);
   EXPECT_TRUE(fDisk->IsAbstract(kNone));
   EXPECT_FALSE(fSsd->IsAbstract(kNone));
 }
 
-TEST_F(TMemoryClassTest, QualifierWithTheValueFalseMarksNothing) {
+TEST_F(TMemoryClassTest, QualifierWithTheValueFalseCountsAsAbsent) {
   Qualify(*fDisk, "Abstract", false);
   Qualify(*fDisk, "Association", false);
   EXPECT_FALSE(fDisk->IsAbstract(kNone));
@@ -110,7 +110,7 @@ TEST_F(TMemoryClassTest, PropertyDeclarationIsRefusedWithItsReason) {
   EXPECT_THAT(Names(*fDisk, &ICIMClass::EnumeratePropertyDecls), ElementsAre("Name"));
 }
 
-TEST_F(TMemoryClassTest, NoPropertyIsDeclaredOnceTheClassOrASubclassHasMadeAnInstance) {
+TEST_F(TMemoryClassTest, NoPropertyIsDeclaredAfterTheFirstInstanceOfTheClassOrASubclass) {
   auto const id = fDevice->AddPropertyDecl("Id", NullOf("uint32"), kNone);
   auto const key = fNs->GetQualifierDecl("Key", kNone);
   fDisk->CommitInstance(fDisk->CreateInstance(kNone), kNone);
@@ -134,7 +134,7 @@ TEST_F(TMemoryClassTest, UnknownPropertyIsNotFoundExceptWhileDeclaring) {
 }
 
 TEST_F(TMemoryClassTest, DeclaringIsNotNested) {
-  fDisk->EndDeclarations(kNone);  // was not begun
+  fDisk->EndDeclarations(kNone);  // without BeginDeclarations
   fDisk->BeginDeclarations(kNone);
   fDisk->BeginDeclarations(kNone);
   fDisk->EndDeclarations(kNone);
@@ -155,7 +155,7 @@ TEST_F(TMemoryClassTest, KeyIsInheritedByAnOverride) {
 
 // ---- Static properties ----
 
-TEST_F(TMemoryClassTest, StaticPropertiesComeInTheOrderInWhichTheyWereFirstSet) {
+TEST_F(TMemoryClassTest, StaticPropertiesHaveTheOrderInWhichTheyWereFirstSet) {
   fDisk->AddPropertyDecl("A", NullOf("string"), kNone);
   fDisk->AddPropertyDecl("B", NullOf("string"), kNone);
   fDevice->AddPropertyDecl("C", NullOf("uint32"), kNone);
@@ -204,7 +204,7 @@ protected:
   }
 };
 
-TEST_F(TMemoryClassInstanceTest, NewInstanceHasDefaultsAndBelongsToNobody) {
+TEST_F(TMemoryClassInstanceTest, NewInstanceHasDefaultsAndIsNotEnumerated) {
   auto const instance = fDisk->CreateInstance(kNone);
   EXPECT_EQ(instance->GetClass(kNone), fDisk);
   EXPECT_TRUE(instance->GetProperty("Id", kNone)->GetValue(kNone).IsNull());
@@ -212,7 +212,7 @@ TEST_F(TMemoryClassInstanceTest, NewInstanceHasDefaultsAndBelongsToNobody) {
   EXPECT_THAT(InstancePaths(*fDisk), IsEmpty());
 }
 
-TEST_F(TMemoryClassInstanceTest, AbstractClassMakesNoInstances) {
+TEST_F(TMemoryClassInstanceTest, AbstractClassCreatesNoInstances) {
   Qualify(*fDisk, "Abstract", true);
   EXPECT_STATUS(fDisk->CreateInstance(kNone), kZEPStatusInvalidClass);
   EXPECT_NO_THROW(Commit(*fSsd, 1));
@@ -242,7 +242,7 @@ TEST_F(TMemoryClassInstanceTest, EnumerationStopsAtTheFirstFalseInEachClass) {
   }
 }
 
-TEST_F(TMemoryClassInstanceTest, OnlyInstancesThatTheClassMadeAreCommitted) {
+TEST_F(TMemoryClassInstanceTest, OnlyInstancesOfTheClassItselfAreCommitted) {
   auto const other = NewNamespace();
   other->DefineClass("X_Disk").Key("Id", "uint32");
   struct {
@@ -267,7 +267,7 @@ TEST_F(TMemoryClassInstanceTest, SameKeysAreCommittedOnce) {
   EXPECT_STATUS(fDisk->CommitInstance(second, kNone), kZEPStatusAlreadyExists);
   EXPECT_THAT(InstancePaths(*fDisk), ElementsAre("X_Disk.Id=\"1\""));
 
-  second->GetProperty("Id", kNone)->SetValue(2u, kNone);  // was not committed, so its key may change
+  second->GetProperty("Id", kNone)->SetValue(2u, kNone);  // not committed, so its key may change
   EXPECT_NO_THROW(fDisk->CommitInstance(second, kNone));
   EXPECT_NO_THROW(Commit(*fSsd, 1));  // another class
 }

@@ -22,7 +22,7 @@ protected:
   boost::shared_ptr<TMemoryInstance> fDisk;
 };
 
-TEST_F(TMemoryInstanceTest, PropertiesComeFromTheTopClassDownAndOverridesInTheirFirstPlace) {
+TEST_F(TMemoryInstanceTest, PropertiesOfSuperclassesComeFirstAndOverridesKeepTheFirstPosition) {
   EXPECT_THAT(Names(*fDisk, &ICIMInstance::EnumerateProperties), ElementsAre("Id", "name", "Sizes", "Tail"));
   EXPECT_EQ(VisitsUntilSecond(*fDisk, &ICIMInstance::EnumerateProperties), 2);
   auto const ssd = fNs->GetClass("X_Ssd", kNone)->CreateInstance(kNone);
@@ -37,7 +37,7 @@ TEST_F(TMemoryInstanceTest, PropertyIsFoundInAnyCaseWithItsNearestDeclaration) {
   EXPECT_FALSE(fDisk->GetProperty("Cells", kNone));
 }
 
-TEST_F(TMemoryInstanceTest, PropertyTakesItsDeclaredTypeOnly) {
+TEST_F(TMemoryInstanceTest, PropertyAcceptsItsDeclaredTypeOnly) {
   auto const id = fDisk->GetProperty("Id", kNone);
   id->SetValue(5u, kNone);
   TCIMValue const refused[] = {TCIMValue(5), TCIMValue("5"), TCIMValue(), NullOf("sint32"), NullOf("uint32[]")};
@@ -50,7 +50,7 @@ TEST_F(TMemoryInstanceTest, PropertyTakesItsDeclaredTypeOnly) {
   EXPECT_TRUE(id->GetValue(kNone).IsNull());
 }
 
-TEST_F(TMemoryInstanceTest, PropertyTakesANewValueOfEachKind) {
+TEST_F(TMemoryInstanceTest, PropertyAcceptsANewValueOfEachKind) {
   TCIMReference one(fNs, "ns:X_Disk.Id=\"1\"", kNone), two(fNs, "ns:X_Disk.Id=\"2\"", kNone);
   struct {
     char const* type;
@@ -58,7 +58,7 @@ TEST_F(TMemoryInstanceTest, PropertyTakesANewValueOfEachKind) {
   } const rows[] = {
       {"boolean", true, false},
       {"real64", 0.5, 1.5},
-      {"char16", TCIMChar16(65), TCIMChar16(66)},  // which compare equal
+      {"char16", TCIMChar16(65), TCIMChar16(66)},  // equal in comparisons
       {"string", "a", "b"},
       {"datetime", TCIMDateTime("20070315143000.000000+060"), TCIMDateTime("20080315143000.000000+060")},
       {"reference", one, two},
@@ -93,7 +93,7 @@ TEST_F(TMemoryInstanceTest, PropertyOutlivesItsInstance) {
   EXPECT_EQ(name->GetName(kNone), "name");
 }
 
-TEST_F(TMemoryInstanceTest, KeysAreFixedOnceTheInstanceIsCommitted) {
+TEST_F(TMemoryInstanceTest, KeysOfACommittedInstanceCannotChange) {
   fDisk->Set("Id", 1);
   fDisk->Set("Id", 2);
   fNs->GetClass("X_Disk", kNone)->CommitInstance(fDisk, kNone);
@@ -112,7 +112,7 @@ TEST_F(TMemoryInstanceTest, PathHasTheClassAndTheKeysThatAreNotNull) {
   EXPECT_EQ(path.GetNamespace(), fNs);
 }
 
-TEST_F(TMemoryInstanceTest, SetTakesPlainLiterals) {
+TEST_F(TMemoryInstanceTest, SetAcceptsPlainLiterals) {
   fDisk->Set("ID", 5);
   EXPECT_EQ(fDisk->Get("Id").GetType(), TType::kCIMTypeUint32);
   EXPECT_EQ(fDisk->Get("iD").ToString(), "5");
@@ -128,7 +128,7 @@ TEST_F(TMemoryInstanceTest, SetTakesPlainLiterals) {
   EXPECT_STATUS(fDisk->Get("Cells"), kZEPStatusNotFound);
 }
 
-TEST_F(TMemoryInstanceTest, ReferenceToItselfNamesIt) {
+TEST_F(TMemoryInstanceTest, AnInstanceMayReferToItself) {
   fDisk->Set("Id", 5);
   TCIMValue const reference = fDisk->GetReference();
   EXPECT_TRUE(reference.IsReference());

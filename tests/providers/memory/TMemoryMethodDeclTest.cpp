@@ -13,7 +13,7 @@ protected:
       fNs->CreateClass(nullptr, "X_Disk", kNone)->AddMethodDecl("Reset", TType::kCIMTypeUint32, kNone);
 };
 
-TEST_F(TMemoryMethodDeclTest, ParametersTellWhatTheyWereAddedWith) {
+TEST_F(TMemoryMethodDeclTest, ParameterHasItsNameTypeAndClass) {
   struct {
     char const* name;
     char const* type;

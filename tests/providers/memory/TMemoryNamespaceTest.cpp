@@ -36,7 +36,7 @@ TEST(TMemoryNamespaceTest, MissingClassIsNotFound) {
   }
 }
 
-TEST(TMemoryNamespaceTest, SecondClassOfANameIsRefusedWhateverItsCase) {
+TEST(TMemoryNamespaceTest, SecondClassOfANameIsRefusedInAnyCase) {
   auto const ns = NewNamespace();
   ns->CreateClass(nullptr, "X_Disk", kNone);
   EXPECT_STATUS(ns->CreateClass(nullptr, "X_Disk", kNone), kZEPStatusAlreadyExists);
@@ -75,7 +75,7 @@ TEST(TMemoryNamespaceTest, NamespaceEnumeratesRootClassesInTheOrderOfCreation) {
   EXPECT_EQ(VisitsUntilSecond(*ns, &ICIMNamespace::EnumerateClasses), 2);
 }
 
-// Classes at every level down to the ninth, two or three below each on the way, created level by level.
+// Classes on nine levels, each with two or three subclasses, created level by level.
 void DefineTree(ICIMNamespace& ns, int depth, std::vector<std::string>& created) {
   std::vector<boost::shared_ptr<ICIMClass>> level{nullptr};
   for (int d = 1; d <= depth; ++d) {
@@ -226,7 +226,7 @@ TEST_F(TMemoryNamespacePathTest, PathWithoutClassOrKeysFindsNothing) {
   EXPECT_FALSE(Find("X_Disk"));
 }
 
-TEST_F(TMemoryNamespacePathTest, PathMadeInAnotherNamespaceFindsByNames) {
+TEST_F(TMemoryNamespacePathTest, PathOfAnotherNamespaceFindsTheInstanceByItsNames) {
   auto const other = NewNamespace();
   other->DefineClass("x_disk").Key("ID", "uint32").Key("BUS", "string");
   other->DefineClass("X_Tape").Key("Id", "uint32");
@@ -250,7 +250,7 @@ TEST_F(TMemoryNamespacePathTest, InstanceThatIsNotCommittedIsNotFound) {
   EXPECT_FALSE(fNs->GetInstance(instance->GetPath(kNone), kNone));
 }
 
-TEST_F(TMemoryNamespacePathTest, KeyThatIsNullIsLeftOutOfThePath) {
+TEST_F(TMemoryNamespacePathTest, NullKeyIsOmittedFromThePath) {
   auto const half = fNs->AddInstance("X_Disk", {{"Id", 8}});
   EXPECT_EQ(half->GetPath(kNone).GetPath(), "X_Disk.Id=\"8\"");
   EXPECT_EQ(Find("X_Disk.Id=\"8\""), half);
@@ -260,7 +260,7 @@ TEST_F(TMemoryNamespacePathTest, KeyThatIsNullIsLeftOutOfThePath) {
   EXPECT_EQ(fNs->GetInstance(withNull, kNone), half);
 }
 
-TEST_F(TMemoryNamespacePathTest, KeyValuesThatLookLikeTwoKeysStayApart) {
+TEST_F(TMemoryNamespacePathTest, KeyValueThatLooksLikeTwoKeysIsOneKey) {
   fNs->DefineClass("X_Pair").Key("A", "string").Key("B", "string");
   auto const one = fNs->AddInstance("X_Pair", {{"A", "1\",B=\"2"}, {"B", "3"}});
   auto const two = fNs->AddInstance("X_Pair", {{"A", "1"}, {"B", "2\",B=\"3"}});
@@ -278,7 +278,7 @@ TEST_F(TMemoryNamespacePathTest, KeysOfEachKindAreFoundByValue) {
       {"boolean", TCIMValue(true), TCIMValue(false)},
       {"uint8", TCIMValue(static_cast<unsigned char>(65)), TCIMValue(static_cast<unsigned char>(66))},
       {"sint64", TCIMValue(-1L), TCIMValue(1L)},
-      {"real32", TCIMValue(1.0000001f), TCIMValue(1.0000002f)},  // which print the same
+      {"real32", TCIMValue(1.0000001f), TCIMValue(1.0000002f)},  // with the same printed text
       {"real64", TCIMValue(0.5), TCIMValue(0.25)},
       {"char16", TCIMValue(TCIMChar16(65)), TCIMValue(TCIMChar16(66))},
       {"string", TCIMValue("a"), TCIMValue("A")},
@@ -304,7 +304,7 @@ TEST_F(TMemoryNamespacePathTest, Char16KeyIsNotFoundByAPathReadFromText) {
   EXPECT_FALSE(Find("X_Drive.Letter=\"67\""));  // a char16 that is read from text is NULL
 }
 
-TEST_F(TMemoryNamespacePathTest, DatetimesOfOneInstantInTwoZonesAreTwoKeys) {
+TEST_F(TMemoryNamespacePathTest, DatetimesOfOneInstantInTwoZonesAreDifferentKeys) {
   fNs->DefineClass("X_Event").Key("Time", "datetime");
   fNs->AddInstance("X_Event", {{"Time", TCIMDateTime("20070315140000.000000+060")}});
   EXPECT_NO_THROW(fNs->AddInstance("X_Event", {{"Time", TCIMDateTime("20070315130000.000000+000")}}));
@@ -322,7 +322,7 @@ TEST_F(TMemoryNamespacePathTest, ReferenceKeyIsComparedByItsNamesInAnyCase) {
 
 // ---- Filling ----
 
-TEST(TMemoryNamespaceTest, DefineClassMakesAClassBelowAnother) {
+TEST(TMemoryNamespaceTest, DefineClassCreatesASubclass) {
   auto const ns = NewNamespace();
   auto const device = ns->DefineClass("X_Device").Class();
   auto const disk = ns->DefineClass("X_Disk", "x_device").Class();
@@ -341,7 +341,7 @@ std::vector<std::string> ErrorsOf(std::function<void()> const& action) {
   return errors;
 }
 
-TEST(TMemoryNamespaceTest, RefusalIsNamedInTheLog) {
+TEST(TMemoryNamespaceTest, RefusalIsLogged) {
   auto const ns = NewNamespace();
   ns->DefineClass("X_Disk").Key("Id", "uint32");
   ns->AddInstance("X_Disk", {{"Id", 5}});
@@ -377,7 +377,7 @@ TEST(TMemoryNamespaceTest, RefusalIsNamedInTheLog) {
   EXPECT_THAT(InstancePaths(*ns->GetClass("X_Disk", kNone)), ElementsAre("X_Disk.Id=\"5\""));
 }
 
-TEST(TMemoryNamespaceTest, StandardQualifiersAreDeclaredOnceAndLeaveOthersAlone) {
+TEST(TMemoryNamespaceTest, StandardQualifiersAreDeclaredOnceAndReplaceNoOthers) {
   auto const ns = NewNamespace();
   auto const own = ns->CreateQualifierDecl("DESCRIPTION", TCIMValue("mine"), 0, 0, kNone);
   ns->DeclareStandardQualifiers();
@@ -389,7 +389,7 @@ TEST(TMemoryNamespaceTest, StandardQualifiersAreDeclaredOnceAndLeaveOthersAlone)
   EXPECT_EQ(Names(*ns, &ICIMNamespace::EnumerateQualifierDecls), names);
 }
 
-// ---- Life time ----
+// ---- Lifetime ----
 
 class TMemoryNamespaceLifeTest : public testing::Test {
 protected:
@@ -426,7 +426,7 @@ TEST_F(TMemoryNamespaceLifeTest, EverythingIsFreedWithTheNamespace) {
 
 TEST_F(TMemoryNamespaceLifeTest, CirclesOfReferencesAreFreedToo) {
   TCIMReference path = fNode->GetPath(kNone);
-  path.GetCIMElement(false);  // from now on it owns the instance
+  path.GetCIMElement(false);  // afterwards it owns the instance
   fNode->Set("Next", path);
   fNode->Set("Others", TCIMValue(TType::kCIMTypeReference, 0, {TCIMValue(path)}));
   path.Clear();
@@ -462,7 +462,7 @@ TEST_F(TMemoryNamespaceLifeTest, ClassThatOutlivesItsNamespaceIsEmpty) {
   EXPECT_TRUE(declaration->GetOwner(kNone).expired());
 }
 
-TEST_F(TMemoryNamespaceLifeTest, InstanceThatOutlivesItsNamespaceKeepsItsValuesButForReferences) {
+TEST_F(TMemoryNamespaceLifeTest, InstanceThatOutlivesItsNamespaceKeepsItsValuesExceptReferences) {
   fNode->Set("Next", fNode->GetReference());
   fClass.reset();
   fNs.reset();
@@ -471,7 +471,7 @@ TEST_F(TMemoryNamespaceLifeTest, InstanceThatOutlivesItsNamespaceKeepsItsValuesB
   EXPECT_THROW(fNode->GetPath(kNone), boost::bad_weak_ptr);
 }
 
-TEST_F(TMemoryNamespaceLifeTest, NamespaceMayGoWhileItIsEnumerated) {
+TEST_F(TMemoryNamespaceLifeTest, NamespaceMayBeDestroyedWhileItIsEnumerated) {
   fNs->AddInstance("X_Node", {{"Id", 2}});
   int visits = 0;
   fClass->EnumerateInstances(

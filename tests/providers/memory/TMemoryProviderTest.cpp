@@ -6,7 +6,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-TEST(TMemoryProviderTest, FillsItsNamespaceAtTheFirstQuestionAndOnlyThen) {
+TEST(TMemoryProviderTest, NamespaceIsFilledOnceAtTheFirstCall) {
   int fills = 0;
   TMemoryProvider provider("Disks", "root/disks", [&](TMemoryNamespace& ns) {
     ++fills;
@@ -23,7 +23,7 @@ TEST(TMemoryProviderTest, FillsItsNamespaceAtTheFirstQuestionAndOnlyThen) {
   EXPECT_EQ(fills, 1);
 }
 
-TEST(TMemoryProviderTest, FailedFillingPassesOnAndIsTriedAgainFromTheStart) {
+TEST(TMemoryProviderTest, FailureOfTheFillFunctionPassesOnAndTheNextCallFillsANewNamespace) {
   int fills = 0;
   TMemoryProvider provider("Disks", "root/disks", [&](TMemoryNamespace& ns) {
     ns.DefineClass("X_Disk");

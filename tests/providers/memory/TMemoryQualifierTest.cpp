@@ -7,7 +7,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-TEST(TMemoryQualifierDeclTest, TellsWhatItWasCreatedWith) {
+TEST(TMemoryQualifierDeclTest, DeclarationHasItsNameTypeScopeFlavorAndDefault) {
   auto const ns = NewNamespace();
   TCIMValue const defaultValue(TType::kCIMTypeString, 4, {TCIMValue("a")});
   auto const decl =
@@ -21,7 +21,7 @@ TEST(TMemoryQualifierDeclTest, TellsWhatItWasCreatedWith) {
   EXPECT_EQ(decl->GetDefaultValue(kNone).GetMaxArraySize(), 4u);
 }
 
-// The qualifiers of every kind of element, which share their code but for the element.
+// The qualifiers of every kind of element.
 class TMemoryQualifierTest : public testing::TestWithParam<char const*> {
 protected:
   TMemoryQualifierTest() {
@@ -42,7 +42,7 @@ protected:
 
   std::vector<std::string> QualifierNames() {
     std::vector<std::string> names = Names(*fElement, &ICIMNamedElement::EnumerateQualifiers);
-    if (!names.empty() && names.front() == "In") names.erase(names.begin());  // the builder's, on the parameter
+    if (!names.empty() && names.front() == "In") names.erase(names.begin());  // the parameter has it from the builder
     return names;
   }
 
@@ -54,7 +54,7 @@ protected:
 INSTANTIATE_TEST_SUITE_P(Elements, TMemoryQualifierTest, testing::Values("class", "property", "method", "parameter"),
                          [](auto const& test) { return std::string(test.param); });
 
-TEST_P(TMemoryQualifierTest, QualifierTellsWhatItWasAddedWith) {
+TEST_P(TMemoryQualifierTest, QualifierHasItsNameValueFlavorAndDeclaration) {
   auto const qualifier = fElement->AddQualifier(fUnits, "bytes", ICIMQualifierDecl::kFlavorToSubclass, kNone);
   EXPECT_EQ(qualifier->GetName(kNone), "Unit");
   EXPECT_EQ(qualifier->GetValue(kNone).ToString(), "bytes");
@@ -96,7 +96,7 @@ TEST(TMemoryQualifierInheritanceTest, QualifierOfASuperclassIsNotItsSubclasses) 
   EXPECT_FALSE(disk->GetPropertyDecl("Id", kNone)->GetQualifier("Key", kNone));
 }
 
-TEST(TMemoryQualifierInheritanceTest, ElementWithoutItsNamespaceTakesNoQualifier) {
+TEST(TMemoryQualifierInheritanceTest, ElementThatOutlivesItsNamespaceRefusesQualifiers) {
   auto ns = NewNamespace();
   auto const cls = ns->CreateClass(nullptr, "X_Disk", kNone);
   auto const decl = ns->CreateQualifierDecl("Unit", NullOf("string"), 0, 0, kNone);

@@ -5,7 +5,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-TEST(TMemoryTypeTest, ReadsTypesAsSchemasWriteThem) {
+TEST(TMemoryTypeTest, TypesAreReadAsInSchemas) {
   struct {
     char const* text;
     int type;
@@ -54,7 +54,7 @@ TEST(TMemoryTypeTest, ReadsTypesAsSchemasWriteThem) {
   }
 }
 
-TEST(TMemoryTypeTest, TakesTheLibrarysOwnTypeTag) {
+TEST(TMemoryTypeTest, TypeMayBeTheLibrarysOwnTag) {
   TMemoryType const type(TCIMValue::TCIMType::kCIMTypeUint32);
   EXPECT_EQ(type.GetType(), TCIMValue::TCIMType::kCIMTypeUint32);
   EXPECT_EQ(type.GetMaxArraySize(), 0u);

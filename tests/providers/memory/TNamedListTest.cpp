@@ -69,7 +69,7 @@ TEST(TNamedListTest, ClearedListFindsNothing) {
   EXPECT_FALSE(list.Has("a"));
 }
 
-TEST(TNamedListTest, VisitStopsAtTheFirstFalseAndSaysSo) {
+TEST(TNamedListTest, VisitStopsAtTheFirstFalseAndReturnsFalse) {
   TList list;
   for (int i = 0; i < 4; ++i) list.Add(Named(std::to_string(i), i));
   std::vector<int> visited;
@@ -81,7 +81,7 @@ TEST(TNamedListTest, VisitStopsAtTheFirstFalseAndSaysSo) {
   EXPECT_TRUE(VisitEach(list.Elements(), [](boost::shared_ptr<TNamed> const&) { return true; }));
 }
 
-TEST(TNamedListTest, VisitOutlivesAChangeOfTheList) {
+TEST(TNamedListTest, TheListMayChangeDuringAVisit) {
   TList list;
   for (int i = 0; i < 3; ++i) list.Add(Named(std::to_string(i), i));
   std::vector<int> visited;

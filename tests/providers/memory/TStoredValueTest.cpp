@@ -6,7 +6,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-TEST(TStoredValueTest, EveryKindOfValueIsTheSameAgain) {
+TEST(TStoredValueTest, EveryKindOfValueIsReturnedUnchanged) {
   TType::ECIMType const kStrings = TType::ECIMType(TType::kCIMTypeString | TType::kCIMTypeArrayFlag);
   for (TCIMValue const& value :
        {TCIMValue(), NullOf("string"), NullOf("uint8[16]"), NullOf("boolean"), NullOf("reference"), TCIMValue(kStrings, 4),

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Large texts of MOF: that time and memory grow with them and no faster, however deep their classes inherit.
+// Large MOF texts: time and memory are proportional to the text, however deep the inheritance is.
 
 #include "Mof.h"
 #include "tests/providers/memory/Collect.h"
@@ -23,7 +23,7 @@ constexpr char kQualifiers[] =
 
 std::string Name(int number) { return "X_C" + std::to_string(number); }
 
-// A chain of so many classes, each with a property; an association if wanted, and an instance of the last.
+// A chain of classes of that depth, each with a property; optionally associations, and an instance of the last class.
 std::string Chain(int depth, bool isAssociation, bool hasInstance) {
   std::string text = kQualifiers;
   for (int at = 0; at < depth; ++at) {
@@ -36,7 +36,7 @@ std::string Chain(int depth, bool isAssociation, bool hasInstance) {
   return text;
 }
 
-TEST(DeepInheritanceTest, AClassAHundredThousandDeepHasWhatItInherits) {
+TEST(DeepInheritanceTest, AClassWithAHundredThousandSuperclassesInheritsFromAll) {
   constexpr int kDepth = 100000;
   auto const ns = NewNamespace();
   ReadMofText(Chain(kDepth, true, true), "deep.mof", ns);
@@ -51,7 +51,7 @@ TEST(DeepInheritanceTest, AClassAHundredThousandDeepHasWhatItInherits) {
   EXPECT_TRUE(last->GetPropertyDecl("Id", kNone)->IsKey(kNone));
 }
 
-// The processor time of the quickest of three runs.
+// The processor time of the fastest of three runs.
 template <class TAction>
 double SecondsOf(TAction const& action) {
   double best = 1e9;
@@ -63,7 +63,7 @@ double SecondsOf(TAction const& action) {
   return best;
 }
 
-TEST(DeepInheritanceTest, TenTimesTheDepthDoesNotCostThirtyTimesAsMuch) {
+TEST(DeepInheritanceTest, TenTimesTheDepthTakesLessThanThirtyTimesAsLong) {
   for (bool const hasInstance : {false, true}) {
     SCOPED_TRACE(hasInstance);
     std::string const small = Chain(1000, false, hasInstance), large = Chain(10000, false, hasInstance);
@@ -78,7 +78,7 @@ TEST(DeepInheritanceTest, TenTimesTheDepthDoesNotCostThirtyTimesAsMuch) {
   }
 }
 
-TEST(DeepInheritanceTest, InstancesMadeFromTheBottomUpwardsAllHaveTheKeysOfTheTop) {
+TEST(DeepInheritanceTest, InstancesCreatedFromTheLowestClassUpwardsHaveTheKeysOfTheHighest) {
   auto const ns = NewNamespace();
   ReadMofText(Chain(50, false, false), "deep.mof", ns);
   for (int at = 49; at >= 0; --at) {
@@ -92,7 +92,7 @@ TEST(DeepInheritanceTest, InstancesMadeFromTheBottomUpwardsAllHaveTheKeysOfTheTo
   }
 }
 
-TEST(DeepInheritanceTest, AClassIsAnAssociationHoweverLateItsSuperclassIsMarked) {
+TEST(DeepInheritanceTest, AClassBecomesAnAssociationWithItsSuperclass) {
   auto const ns = NewNamespace();
   ReadMofText(Chain(20, false, false), "deep.mof", ns);
   auto const mark = [&](int at, bool value) {
@@ -110,9 +110,9 @@ TEST(DeepInheritanceTest, AClassIsAnAssociationHoweverLateItsSuperclassIsMarked)
   EXPECT_TRUE(ns->CreateClass(ns->GetClass(Name(19), kNone), "X_New", kNone)->GetClassFlag(kNone));
 }
 
-// The greatest memory of a process that reads the file, in bytes.
+// The peak memory of a process that reads the file, in bytes.
 double PeakOfReading(std::string const& path) {
-  ::malloc_trim(0);  // what the tests before left would be used first
+  ::malloc_trim(0);  // the process would use free memory of earlier tests first
   pid_t const child = ::fork();
   if (child == 0) {
     ReadMofFile(path, NewNamespace());
@@ -125,7 +125,7 @@ double PeakOfReading(std::string const& path) {
   return usage.ru_maxrss * 1024.0;
 }
 
-TEST(DeepInheritanceTest, ASchemaTakesSevenAndAHalfBytesOfMemoryForEachOfItsOwnAtTheMost) {
+TEST(DeepInheritanceTest, ASchemaTakesAtMostSevenAndAHalfTimesItsSizeInMemory) {
   if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which takes memory of its own";
   std::string text = kQualifiers;
   for (int at = 0; at < 5000; ++at) {
@@ -143,7 +143,7 @@ TEST(DeepInheritanceTest, ASchemaTakesSevenAndAHalfBytesOfMemoryForEachOfItsOwnA
   WriteFile(dir.Path("schema.mof"), text);
   double const taken = PeakOfReading(dir.Path("schema.mof")) - PeakOfReading(dir.Path("empty.mof"));
   EXPECT_LT(taken / static_cast<double>(text.size()), 7.5);
-  EXPECT_GT(taken, 0.5 * static_cast<double>(text.size()));  // it was measured at all
+  EXPECT_GT(taken, 0.5 * static_cast<double>(text.size()));  // the measurement worked
 }
 
 }  // namespace

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// The real schema, whole: loaded, copied, written and read back.
+// The complete schema of the DMTF: loaded, copied, written and read back.
 
 #include "tests/DmtfSchema.h"
 
@@ -57,7 +57,7 @@ int StepsAbove(boost::shared_ptr<ICIMClass> cls) {
   return steps;
 }
 
-// How often each thing occurs, by a name of it.
+// The number of elements of each kind, by a name of the kind.
 class TCounts {
 public:
   explicit TCounts(ICIMNamespace const& ns) {
@@ -109,8 +109,8 @@ private:
   std::map<std::string, int> fCounts;
 };
 
-// The figures that a tokeniser of another hand found in the same files.
-TEST_F(DmtfSchemaTest, EverythingInItIsLoaded) {
+// The numbers that an independent tokeniser found in the same files.
+TEST_F(DmtfSchemaTest, TheSchemaIsLoadedCompletely) {
   EXPECT_EQ(TCounts(*fSource).Get(), (std::map<std::string, int>{{"qualifier declarations", 70},
                                                                  {"classes", 1631},
                                                                  {"CIM_ classes", 1570},
@@ -144,12 +144,12 @@ TEST_F(DmtfSchemaTest, EverythingInItIsLoaded) {
                                                                  {"sint64", 3}}));
 }
 
-TEST_F(DmtfSchemaTest, ACopyHasAllOfItOnceAndTheSameText) {
+TEST_F(DmtfSchemaTest, ACopyIsCompleteAndHasTheSameText) {
   auto const copy = NewNamespace();
   OnNewThread([&] {
     TLogCapture const log;
     TCIMCopy::CopyClasses(fSource, copy, false);
-    EXPECT_THAT(log.Entries(), IsEmpty());  // nothing was left out
+    EXPECT_THAT(log.Entries(), IsEmpty());  // nothing was skipped
   });
   EXPECT_EQ(TCounts(*copy).Get(), TCounts(*fSource).Get());
   std::string const text = WriteMof(*fSource);
@@ -157,7 +157,7 @@ TEST_F(DmtfSchemaTest, ACopyHasAllOfItOnceAndTheSameText) {
   EXPECT_TRUE(WriteMof(*copy) == text);
 }
 
-TEST_F(DmtfSchemaTest, WhatIsWrittenReadsBackAsTheSame) {
+TEST_F(DmtfSchemaTest, TheWrittenSchemaIsReadBackUnchanged) {
   std::string const text = WriteMof(*fSource);
   auto const again = NewNamespace();
   ReadMofText(text, "schema.mof", again);
@@ -165,12 +165,12 @@ TEST_F(DmtfSchemaTest, WhatIsWrittenReadsBackAsTheSame) {
   EXPECT_TRUE(WriteMof(*again) == text);
 }
 
-TEST_F(DmtfSchemaTest, TheLongestLineOfDescentHasNineSteps) {
+TEST_F(DmtfSchemaTest, TheDeepestClassHasNineSuperclasses) {
   EXPECT_EQ(StepsAbove(fSource->GetClass("CIM_VTOCDiskPartition", kNone)), 9);
 }
 
-// A text of the first file that is broken up into lines and escaped.
-TEST_F(DmtfSchemaTest, StringsAreJoinedAndTheirEscapesRead) {
+// A text of the first file that is split into several strings and escaped.
+TEST_F(DmtfSchemaTest, StringsAreJoinedAndUnescaped) {
   auto const caption = fSource->GetClass("CIM_ManagedElement", kNone)->GetPropertyDecl("InstanceID", kNone);
   std::string const text = caption->GetQualifier("Description", kNone)->GetValue(kNone);
   EXPECT_THAT(text,

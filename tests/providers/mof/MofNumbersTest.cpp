@@ -43,7 +43,7 @@ TEST(MofNumbersTest, ANumberIsReadInItsBaseAndType) {
   }
 }
 
-TEST(MofNumbersTest, ANumberIsNoValueOfAnotherKindOfType) {
+TEST(MofNumbersTest, ANumberIsNotAValueOfAnotherKindOfType) {
   TMofFile const file{"numbers", "1"};
   for (TType const type : {TType::kCIMTypeString, TType::kCIMTypeBoolean, TType::kCIMTypeDateTime, TType::kCIMTypeReference})
     EXPECT_EQ(StatusOf([&] { ReadMofNumber("1", type, {&file, file.fText}); }), kZEPStatusInvalidFormat) << type.ToString();

@@ -25,7 +25,7 @@ TEST(MofPathTest, KeysOfEveryTypeAreReadFromPaths) {
   EXPECT_EQ(link.GetClassName(), "X_L");
 }
 
-// As the library itself prints paths.
+// In the form in which the library prints paths.
 TEST(MofPathTest, KeysOfEveryTypeMayBeQuoted) {
   auto const ns = Read(
       "class X_K { [Key] boolean B; [Key] sint8 N; [Key] real64 R; [Key] char16 C; X_K REF Next; };"

@@ -80,7 +80,7 @@ TEST(MofWriterTest, PlainClassesComeBeforeAssociationsAndACopyHasTheSameText) {
   EXPECT_EQ(WriteMof(*ReadBack(text)), text);
 }
 
-// Where an association is a subclass of a plain class, the copy comes to it later than the source.
+// A copy creates an association that is a subclass of a plain class later than the source did.
 TEST(MofWriterTest, ACopyHasTheSameTextWhenKindsAreMixed) {
   auto const ns = NewNamespace();
   ns->DefineClass("X_Top");

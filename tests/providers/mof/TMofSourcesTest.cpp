@@ -8,7 +8,7 @@
 #include <cerrno>
 #include <filesystem>
 
-// While one lives, every file fails with that error once so many bytes of it were read.
+// During its lifetime, reading any file fails with that error after so many bytes.
 class TReadFault {
 public:
   TReadFault(std::size_t readable, int error) {
@@ -21,7 +21,7 @@ public:
   static inline int gError = 0;
 };
 
-// The linker puts these in the place of read.
+// The linker replaces read by the second of these; the first is the real one.
 extern "C" ssize_t __real_read(int fd, void* buffer, std::size_t size);
 extern "C" ssize_t __wrap_read(int fd, void* buffer, std::size_t size) {
   if (TReadFault::gError == 0) return __real_read(fd, buffer, size);
@@ -48,7 +48,7 @@ protected:
 
   void Write(std::string const& name, std::string const& text) { WriteFile(fDir.Path("schema/" + name), text); }
 
-  // What reading schema/all.mof comes to: the classes, or the error without the folder.
+  // The result of reading schema/all.mof: the classes, or the error without the directory.
   std::string Result() {
     auto const ns = NewNamespace();
     try {
@@ -95,7 +95,7 @@ TEST_F(TMofSourcesTest, IncludesStayWithinTheDirectoryOfTheFirstFile) {
   EXPECT_EQ(Result(), std::string("core/up.mof:1:18: ") + kRefusal);
 
   fs::create_directories(fDir.Path("schema2"));
-  WriteFile(fDir.Path("schema2/a.mof"), "class X_A { };");  // a folder whose name only begins alike
+  WriteFile(fDir.Path("schema2/a.mof"), "class X_A { };");  // a directory whose name begins with that of the first
   Write("all.mof", "#pragma include (\"../schema2/a.mof\")");
   EXPECT_EQ(Result(), std::string("all.mof:1:18: ") + kRefusal);
 
@@ -132,7 +132,7 @@ TEST_F(TMofSourcesTest, AnUnreadableFileHasAReason) {
 TEST_F(TMofSourcesTest, AReadErrorInTheMiddleOfAFileIsReportedAndNothingIsDeclared) {
   std::string const text = "class X_1 { };\nclass X_2 { };\n";
   Write("all.mof", text);
-  for (std::size_t const readable : {std::size_t(0), text.find('\n') + 1, text.size()}) {  // each a text of its own right
+  for (std::size_t const readable : {std::size_t(0), text.find('\n') + 1, text.size()}) {  // each prefix is valid MOF
     SCOPED_TRACE(readable);
     TReadFault const fault(readable, EIO);
     auto const ns = NewNamespace();
@@ -150,7 +150,7 @@ TEST_F(TMofSourcesTest, AReadErrorInAnIncludedFileNamesTheDirective) {
   EXPECT_EQ(Result(), "all.mof:1:18: the included file cannot be read: Input/output error");
 }
 
-// The memory of a process is a file without size, whose first bytes cannot be read.
+// The memory of a process is a file without size, of which the first bytes cannot be read.
 TEST_F(TMofSourcesTest, AFileWithoutSizeIsReadToItsEnd) {
   EXPECT_EQ(StatusOf([] { ReadMofFile("/proc/self/mem", NewNamespace()); }), kZEPStatusFileSystemError);
   EXPECT_EQ(StatusOf([] { ReadMofFile("/proc/self/status", NewNamespace()); }), kZEPStatusInvalidFormat);

@@ -143,14 +143,14 @@ TEST_F(ReportTest, EachRowHasItsValueOrItsReason) {
       {"full", "Manufacturer", "Example Works"},
       {"full", "UUID", "unknown: the firmware gives none (all zeros)"},
       {"full", "BIOS version", "-[ABE123CUS-1.10]-"},
-      {"full", "BIOS date", "unknown: the firmware gives no text"},
+      {"full", "BIOS date", "unknown: not given by the firmware"},
       {"full", "Chassis", "Other"},
       {"full", "Processors", "1 x pc-i440fx-7.2, 1 core"},
       {"full", "Memory", "512 MiB in 1 module"},
       {"full", "Architecture", "x86_64"},
       {"eight", "Machine type", "none: the product name has no machine type and model in \"-[...]-\""},
       {"eight", "Model", "none: the product name has no machine type and model in \"-[...]-\""},
-      {"no-serial", "Serial number", "unknown: the firmware gives no text"},
+      {"no-serial", "Serial number", "unknown: not given by the firmware"},
       {"two-dashes", "Serial number", "KQ 99 (not in the collector's own form: 7 letters and digits)"},
   };
   for (TRow const& row : rows) EXPECT_EQ(ValueIn(Report(RealTablePath(row.table)).output, row.label), row.value) << row.table;
@@ -409,7 +409,7 @@ TEST_F(ReportTest, JsonTellsWhyAPropertyIsNull) {
     EXPECT_EQ(serial["type"], "string");
     EXPECT_TRUE(serial["value"].is_null());
     EXPECT_EQ(serial["code"], "not-given");
-    EXPECT_EQ(serial["reason"], "the firmware gives no text");
+    EXPECT_EQ(serial["reason"], "not given by the firmware");
     EXPECT_EQ(serial["source"], "SMBIOS type 1 (file)");
     EXPECT_EQ(instance["properties"]["Name"]["key"], true);
     return;
