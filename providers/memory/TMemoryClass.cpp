@@ -88,9 +88,13 @@ boost::shared_ptr<ICIMInstance> TMemoryClass::CreateInstance(TCIMContext const& 
 }
 
 void TMemoryClass::EnumerateInstances(boost::function<bool(boost::shared_ptr<ICIMInstance>)> callback, TCIMContext const&) const {
-  if (!VisitEach(fInstances, callback)) return;
+  if (!VisitInstances(callback)) return;
   for (auto const& subClass : AllSubClasses())
-    if (!VisitEach(subClass->fInstances, callback)) return;
+    if (!subClass->VisitInstances(callback)) return;
+}
+
+bool TMemoryClass::VisitInstances(boost::function<bool(boost::shared_ptr<ICIMInstance>)> const& callback) const {
+  return !fInstances || VisitEach(fInstances->fAll, callback);
 }
 
 boost::shared_ptr<ICIMMethodDecl> TMemoryClass::AddMethodDecl(std::string const& name, TCIMValue::TCIMType returnType,
@@ -115,8 +119,9 @@ void TMemoryClass::CommitInstance(boost::shared_ptr<ICIMInstance> instance, TCIM
   if (own->IsCommitted()) throw TZEPException(kZEPStatusAlreadyExists);
 
   std::string const keys = KeyText(own->GetPath(context));
-  if (!keys.empty() && !fInstancesByKeys.emplace(keys, own).second) throw TZEPException(kZEPStatusAlreadyExists);
-  fInstances.push_back(own);
+  if (!fInstances) fInstances = std::make_unique<TInstances>();
+  if (!keys.empty() && !fInstances->fByKeys.emplace(keys, own).second) throw TZEPException(kZEPStatusAlreadyExists);
+  fInstances->fAll.push_back(own);
   own->SetCommitted();
 }
 
@@ -142,14 +147,17 @@ boost::shared_ptr<TMemoryPropertyDecl> TMemoryClass::FindPropertyDecl(std::strin
 }
 
 boost::shared_ptr<TMemoryInstance> TMemoryClass::FindInstance(TCIMReference const& path) const {
-  auto const found = fInstancesByKeys.find(KeyText(path));
-  return found == fInstancesByKeys.end() ? boost::shared_ptr<TMemoryInstance>() : found->second;
+  if (!fInstances) return {};
+  auto const found = fInstances->fByKeys.find(KeyText(path));
+  return found == fInstances->fByKeys.end() ? boost::shared_ptr<TMemoryInstance>() : found->second;
 }
 
 void TMemoryClass::Empty() {
-  for (auto const& instance : fInstances) instance->DropReferences();
-  fInstancesByKeys.clear();
-  fInstances.clear();
+  if (fInstances) {  // and not reset: a callback may empty the class while its instances are visited
+    for (auto const& instance : fInstances->fAll) instance->DropReferences();
+    fInstances->fByKeys.clear();
+    fInstances->fAll.clear();
+  }
   fLayout.reset();
   fHasMadeInstances = false;
   fStaticProperties.Clear();

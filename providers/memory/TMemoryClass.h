@@ -7,6 +7,7 @@
 #include "TMemoryNamedElement.h"
 #include "TMemoryPropertyDecl.h"
 
+#include <memory>
 #include <string>
 #include <unordered_map>
 #include <vector>
@@ -79,7 +80,13 @@ public:
 
 private:
   boost::shared_ptr<TMemoryClass> Self() { return boost::static_pointer_cast<TMemoryClass>(shared_from_this()); }
+  struct TInstances {
+    std::vector<boost::shared_ptr<TMemoryInstance>> fAll;
+    std::unordered_map<std::string, boost::shared_ptr<TMemoryInstance>> fByKeys;  // those that have a key value
+  };
+
   boost::shared_ptr<TMemoryLayout const> Layout();  // created by the first call
+  bool VisitInstances(boost::function<bool(boost::shared_ptr<ICIMInstance>)> const& callback) const;
   void DeclareIn(TMemoryLayout& layout) const;
   void MarkAsAssociation();
   std::vector<boost::shared_ptr<TMemoryClass>> AllSubClasses() const;  // in the order of EnumerateSubClasses
@@ -96,8 +103,7 @@ private:
   TNamedList<TMemoryProperty> fStaticProperties;
 
   boost::shared_ptr<TMemoryLayout const> fLayout;  // created for the first instance; some superclasses have one, too
-  std::vector<boost::shared_ptr<TMemoryInstance>> fInstances;
-  std::unordered_map<std::string, boost::shared_ptr<TMemoryInstance>> fInstancesByKeys;  // those that have a key value
+  std::unique_ptr<TInstances> fInstances;          // null before the first instance: most classes have none
 };
 
 }  // namespace NQRVZEP20

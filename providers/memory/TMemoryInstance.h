@@ -6,6 +6,8 @@
 #include "TMemoryProperty.h"
 #include "TNamedList.h"
 
+#include <boost/enable_shared_from_this.hpp>
+
 #include <string>
 #include <utility>
 #include <vector>
@@ -25,8 +27,8 @@ struct TMemoryLayout {
   std::vector<std::size_t> fKeys;  // positions in fDecls
 };
 
-// An instance. Created by TMemoryClass.
-class TMemoryInstance : public ICIMInstance {
+// An instance. Created by TMemoryClass. A property that is in use keeps its instance alive.
+class TMemoryInstance : public ICIMInstance, public boost::enable_shared_from_this<TMemoryInstance> {
 public:
   TMemoryInstance(boost::weak_ptr<TMemoryClass> cls, boost::shared_ptr<TMemoryLayout const> layout);
 
@@ -58,12 +60,13 @@ public:
   void DropReferences();
 
 private:
-  TMemoryProperty& PropertyOf(std::string const& name) const;  // or throws kZEPStatusNotFound
+  std::size_t PositionOf(std::string const& name) const;  // or throws kZEPStatusNotFound
+  boost::shared_ptr<ICIMProperty> PropertyAt(std::size_t position) const;
 
   boost::weak_ptr<TMemoryClass> fClass;
   boost::shared_ptr<TMemoryLayout const> fLayout;
   bool fIsCommitted = false;
-  std::vector<boost::shared_ptr<TMemoryProperty>> fProperties;  // one for each declaration of fLayout
+  std::vector<TMemoryProperty> fProperties;  // one for each declaration of fLayout; never grows, so their addresses are fixed
 };
 
 }  // namespace NQRVZEP20

@@ -7,6 +7,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -30,11 +31,16 @@ class TNamedList {
 public:
   static constexpr std::size_t kNone = static_cast<std::size_t>(-1);
 
+  TNamedList() = default;
+  TNamedList(TNamedList const& other)
+      : fElements(other.fElements), fIndex(other.fIndex ? std::make_unique<TIndex>(*other.fIndex) : nullptr) {}
+  TNamedList& operator=(TNamedList const&) = delete;
+
   // The list must not contain an element of that name.
   void Add(boost::shared_ptr<TElement> element) {
     fElements.push_back(std::move(element));
     if (fElements.size() <= kMostWithoutIndex) return;
-    if (2 * fElements.size() > fIndex.size())
+    if (!fIndex || 2 * fElements.size() > fIndex->size())
       MakeIndex();
     else
       Enter(fElements.size() - 1);
@@ -50,8 +56,8 @@ public:
   bool Has(std::string const& name) const { return PositionOf(name) != kNone; }
 
   std::size_t PositionOf(std::string const& name) const {
-    if (!fIndex.empty()) {
-      std::uint32_t const entry = fIndex[SlotOf(name)];
+    if (fIndex) {
+      std::uint32_t const entry = (*fIndex)[SlotOf(name)];
       return entry == 0 ? kNone : entry - 1;
     }
     for (std::size_t i = 0; i < fElements.size(); ++i)
@@ -68,33 +74,36 @@ public:
   std::vector<boost::shared_ptr<TElement>> const& Elements() const { return fElements; }
 
   void Clear() {
-    fIndex.clear();
+    fIndex.reset();
     fElements.clear();
   }
 
 private:
+  using TIndex = std::vector<std::uint32_t>;  // a hash table: positions plus 1, and 0 for a free slot; its size is a power of 2
+
   static constexpr std::size_t kMostWithoutIndex = 8;
 
   // The slot of the element of that name, or the free slot for it.
   std::size_t SlotOf(std::string const& name) const {
-    std::size_t const mask = fIndex.size() - 1;
+    TIndex const& index = *fIndex;
+    std::size_t const mask = index.size() - 1;
     std::size_t slot = TNameHash()(name) & mask;
-    while (fIndex[slot] != 0 && !IsSameName(fElements[fIndex[slot] - 1]->Name(), name)) slot = (slot + 1) & mask;
+    while (index[slot] != 0 && !IsSameName(fElements[index[slot] - 1]->Name(), name)) slot = (slot + 1) & mask;
     return slot;
   }
 
-  void Enter(std::size_t position) { fIndex[SlotOf(fElements[position]->Name())] = static_cast<std::uint32_t>(position + 1); }
+  void Enter(std::size_t position) { (*fIndex)[SlotOf(fElements[position]->Name())] = static_cast<std::uint32_t>(position + 1); }
 
   // Rebuilds the index, large enough for the list to double.
   void MakeIndex() {
     std::size_t size = 4 * kMostWithoutIndex;
     while (size < 3 * fElements.size()) size *= 2;
-    fIndex.assign(size, 0);
+    fIndex = std::make_unique<TIndex>(size, 0);
     for (std::size_t i = 0; i < fElements.size(); ++i) Enter(i);
   }
 
   std::vector<boost::shared_ptr<TElement>> fElements;
-  std::vector<std::uint32_t> fIndex;  // empty, or a hash table: positions plus 1, and 0 for a free slot; a power of 2
+  std::unique_ptr<TIndex> fIndex;  // null while the list is short
 };
 
 }  // namespace NQRVZEP20

@@ -23,12 +23,14 @@ TCIMContext const kNone;
 
 bool IsAlias(TMofValue const& value) { return !value.fIsArray && value.fLiterals.front().fKind == TMofLiteral::kAlias; }
 
+TMofInstance HeadOf(TMofInstanceText const& text) { return TMofParser(*text.fFile, text.fKeyword).ParseInstanceHead(); }
+
 }  // namespace
 
 void TMofInstances::Build() {
   std::size_t const count = fDocument.fInstances.size();
-  for (TMofInstanceText const& instance : fDocument.fInstances)
-    Create(TMofParser(*instance.fFile, instance.fKeyword).ParseInstanceHead());
+  fCreated.reserve(count);
+  for (TMofInstanceText const& instance : fDocument.fInstances) Create(HeadOf(instance));
   for (std::size_t number = 0; number < count; ++number) SetPlainValues(number);
   for (std::size_t number = 0; number < count; ++number) SetKeys(number);
   for (std::size_t number = 0; number < count; ++number) Commit(number);
@@ -42,7 +44,7 @@ void TMofInstances::Create(TMofInstance const& instance) {
                            [&] { return cls->CreateInstance(kNone); });
   if (!instance.fAlias.fText.empty() && !fAliases.emplace(FoldName(TextAt(instance.fAlias)), fCreated.size()).second)
     throw TMofError(instance.fAlias, TextAt(instance.fAlias) + " is already the alias of another instance");
-  fCreated.push_back({instance.fClassName, cls, made, kNotSet});
+  fCreated.push_back({made, kNotSet});
 }
 
 void TMofInstances::SetPlainValues(std::size_t number) {
@@ -85,8 +87,9 @@ void TMofInstances::SetAliases(std::size_t number, bool keys) {
 }
 
 void TMofInstances::Commit(std::size_t number) {
-  StepAt(fCreated[number].fClassName, kZEPStatusAlreadyExists, "already has an instance with the same keys",
-         [&] { fCreated[number].fClass->CommitInstance(fCreated[number].fInstance, kNone); });
+  TMofSpan const name = HeadOf(fDocument.fInstances[number]).fClassName;
+  StepAt(name, kZEPStatusAlreadyExists, "already has an instance with the same keys",
+         [&] { fNamespace->GetClass(TextAt(name), kNone)->CommitInstance(fCreated[number].fInstance, kNone); });
 }
 
 boost::shared_ptr<ICIMProperty> TMofInstances::PropertyOf(std::size_t number, TMofSpan const& name) const {

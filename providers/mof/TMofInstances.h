@@ -31,8 +31,6 @@ private:
   };
 
   struct TCreated {
-    TMofSpan fClassName;
-    boost::shared_ptr<ICIMClass> fClass;
     boost::shared_ptr<ICIMInstance> fInstance;
     EKeys fKeys;
   };

@@ -125,8 +125,18 @@ double PeakOfReading(std::string const& path) {
   return usage.ru_maxrss * 1024.0;
 }
 
+// The peak memory that reading the text takes, as a multiple of the size of the text.
+double MemoryPerByteOf(std::string const& text) {
+  TTempDir const dir;
+  WriteFile(dir.Path("empty.mof"), "");
+  WriteFile(dir.Path("text.mof"), text);
+  double const taken = PeakOfReading(dir.Path("text.mof")) - PeakOfReading(dir.Path("empty.mof"));
+  EXPECT_GT(taken, 0.5 * static_cast<double>(text.size()));  // the measurement worked
+  return taken / static_cast<double>(text.size());
+}
+
 TEST(DeepInheritanceTest, ASchemaTakesAtMostSevenAndAHalfTimesItsSizeInMemory) {
-  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which takes memory of its own";
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer takes memory of its own";
   std::string text = kQualifiers;
   for (int at = 0; at < 5000; ++at) {
     std::string const number = std::to_string(at);
@@ -138,12 +148,24 @@ TEST(DeepInheritanceTest, ASchemaTakesAtMostSevenAndAHalfTimesItsSizeInMemory) {
               ";\n";
     text += "  [Description(\"Starts the part, after a delay in seconds.\")]\n  uint32 Start(uint32 Delay, string Name);\n};\n";
   }
-  TTempDir const dir;
-  WriteFile(dir.Path("empty.mof"), "");
-  WriteFile(dir.Path("schema.mof"), text);
-  double const taken = PeakOfReading(dir.Path("schema.mof")) - PeakOfReading(dir.Path("empty.mof"));
-  EXPECT_LT(taken / static_cast<double>(text.size()), 7.5);
-  EXPECT_GT(taken, 0.5 * static_cast<double>(text.size()));  // the measurement worked
+  EXPECT_LT(MemoryPerByteOf(text), 7.5);
+}
+
+TEST(DeepInheritanceTest, EmptyClassesTakeAtMostTwentyFourTimesTheirTextInMemory) {
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer takes memory of its own";
+  std::string text;
+  for (int at = 0; at < 40000; ++at) text += "class " + Name(at) + " {\n};\n";
+  EXPECT_LT(MemoryPerByteOf(text), 24);
+}
+
+TEST(DeepInheritanceTest, InstancesTakeAtMostTenTimesTheirTextInMemory) {
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer takes memory of its own";
+  std::string text = std::string(kQualifiers) + "class X_Disk { [Key] uint32 Id; string Name; uint64 Size; };\n";
+  for (int at = 0; at < 40000; ++at) {
+    std::string const number = std::to_string(at);
+    text += "instance of X_Disk {\n  Id = " + number + ";\n  Name = \"disk " + number + "\";\n  Size = " + number + "000;\n};\n";
+  }
+  EXPECT_LT(MemoryPerByteOf(text), 10);
 }
 
 }  // namespace
