@@ -6,9 +6,9 @@
 
 #include <map>
 
-namespace NQRVZEP20::zep {
+namespace NQRVZEP20 {
 
-bool IsSet(ICIMClass const& cls, std::string const& qualifierName) {
+bool HasSetQualifier(ICIMClass const& cls, std::string const& qualifierName) {
   auto const qualifier = cls.GetQualifier(qualifierName, TCIMContext());
   return qualifier && !(qualifier->GetValue(TCIMContext()) == TCIMValue(false));
 }
@@ -25,7 +25,7 @@ public:
     std::string const superName = superClass ? superClass->GetName(TCIMContext()) : "";
     auto const above = fNumbers.find(superName);
     bool const isBelow = above != fNumbers.end();
-    bool const isIndication = IsSet(*cls, "Indication") || (isBelow && fEntries[above->second].fIsIndication);
+    bool const isIndication = HasSetQualifier(*cls, "Indication") || (isBelow && fEntries[above->second].fIsIndication);
     std::string const name = cls->GetName(TCIMContext());
     fNumbers[name] = fEntries.size();
     fEntries.push_back({cls, name, superName, cls->IsAbstract(TCIMContext()), cls->GetClassFlag(TCIMContext()), isIndication,
@@ -53,4 +53,4 @@ std::vector<TClassEntry> ClassesOf(ICIMNamespace const& ns) {
   return entries;
 }
 
-}  // namespace NQRVZEP20::zep
+}  // namespace NQRVZEP20

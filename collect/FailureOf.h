@@ -4,9 +4,10 @@
 #include <exception>
 #include <string>
 
-namespace NQRVZEP20::zep {
+namespace NQRVZEP20 {
 
-// Calls `work`, which runs code of a plug-in, and returns why it failed; empty when it did not. A plug-in may throw anything.
+// Calls `work`, which runs code of a plug-in, and returns why it failed; empty when it succeeded. A plug-in may throw anything,
+// so nothing that `work` throws leaves this function.
 template <class TWork>
 std::string FailureOf(TWork work) {
   try {
@@ -15,8 +16,8 @@ std::string FailureOf(TWork work) {
   } catch (std::exception const& failure) {
     return failure.what();
   } catch (...) {
-    return "it threw something that is no exception of the standard library";
+    return "it threw something that is not a std::exception";
   }
 }
 
-}  // namespace NQRVZEP20::zep
+}  // namespace NQRVZEP20

@@ -6,7 +6,7 @@
 
 #include <boost/make_shared.hpp>
 
-namespace NQRVZEP20::zep {
+namespace NQRVZEP20 {
 
 TNamespaceView ViewOfMof(std::string const& file) {
   auto const ns = boost::make_shared<TMemoryNamespace>("mof");
@@ -14,4 +14,4 @@ TNamespaceView ViewOfMof(std::string const& file) {
   return TNamespaceView(file, ns);
 }
 
-}  // namespace NQRVZEP20::zep
+}  // namespace NQRVZEP20

@@ -5,9 +5,7 @@
 #include "INamespaceProvider.h"
 #include "TOSSpecific.h"
 #include "TRootObject.h"
-#include "tools/zep/output/Failure.h"
-#include "tools/zep/output/Output.h"
-#include "tools/zep/output/Text.h"
+#include "collect/FailureOf.h"
 
 #include <algorithm>
 #include <chrono>
@@ -15,7 +13,7 @@
 #include <map>
 #include <stdexcept>
 
-namespace NQRVZEP20::zep {
+namespace NQRVZEP20 {
 
 namespace {
 
@@ -60,12 +58,12 @@ std::string ErrorLoggedSince(std::size_t entriesBefore) {
   return error;
 }
 
-TProviderRun Ask(std::string const& name, boost::shared_ptr<INamespaceProvider> provider) {
+TProviderRun Fill(std::string const& name, boost::shared_ptr<INamespaceProvider> provider, std::string const& sampleLabel) {
   TProviderRun run{name, {}, 0, ""};
   auto const fill = [&] {
     auto const ns = provider->GetNamespace(TCIMContext());
     if (!ns) throw std::runtime_error("it has no namespace");
-    run.fView = std::make_shared<TNamespaceView>(name, ns);
+    run.fView = std::make_shared<TNamespaceView>(name, ns, sampleLabel);
   };
   std::size_t const entries = TRootObject::GetCoreLogger()->GetLog().size();
   run.fError = TimedFailureOf(fill, run.fMilliseconds);
@@ -73,14 +71,14 @@ TProviderRun Ask(std::string const& name, boost::shared_ptr<INamespaceProvider> 
   return run;
 }
 
-TPlugIn Load(std::string const& name) {
+TPlugIn Load(std::string const& name, std::string const& sampleLabel) {
   TPlugIn plugIn{name, PlugInDirectory() + TOSSpecific::kFileSeparator + "lib" + name + kNSPExtension, 0, "", {}};
   TProviders const before = RegisteredProviders();
   plugIn.fError = TimedFailureOf([&] { TOSSpecific::LoadNSPLibrary(name); }, plugIn.fMilliseconds);
   if (!plugIn.fError.empty()) plugIn.fError = LinkerReason(name, plugIn.fError);
 
   for (auto const& [providerName, provider] : RegisteredProviders())
-    if (before.count(providerName) == 0) plugIn.fProviders.push_back(Ask(providerName, provider));
+    if (before.count(providerName) == 0) plugIn.fProviders.push_back(Fill(providerName, provider, sampleLabel));
   return plugIn;
 }
 
@@ -91,12 +89,12 @@ bool TPlugIn::HasFailed() const {
          std::any_of(fProviders.begin(), fProviders.end(), [](TProviderRun const& run) { return !run.fError.empty(); });
 }
 
-std::vector<TPlugIn> LoadPlugIns() {
-  TOutputGuard const guard;
+std::vector<TPlugIn> LoadPlugIns(std::optional<TSample> const& sample) {
+  if (sample) SetForProviders(*sample);
   std::vector<std::string> names = TOSSpecific::FindNSPs();
   std::sort(names.begin(), names.end());
   std::vector<TPlugIn> plugIns;
-  for (std::string const& name : names) plugIns.push_back(Load(name));
+  for (std::string const& name : names) plugIns.push_back(Load(name, sample ? sample->fLabel : ""));
   return plugIns;
 }
 
@@ -122,4 +120,4 @@ std::vector<std::string> FailuresOf(std::vector<TPlugIn> const& plugIns) {
 
 std::string PlugInDirectory() { return std::filesystem::path(TOSSpecific::GetZEPRootPath()).lexically_normal().string(); }
 
-}  // namespace NQRVZEP20::zep
+}  // namespace NQRVZEP20

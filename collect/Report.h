@@ -1,46 +1,67 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "collect/ECompleteness.h"
 #include "collect/PlugIns.h"
-#include "collect/TNamespaceView.h"
-#include "tools/zep/output/ExitStatus.h"
-#include "tools/zep/output/Json.h"
+#include "collect/Sample.h"
+#include "collect/TAnswer.h"
 
+#include <cstddef>
+#include <cstdint>
+#include <optional>
 #include <string>
+#include <variant>
 #include <vector>
 
-namespace NQRVZEP20::zep {
+namespace NQRVZEP20 {
+
+struct TDate {
+  unsigned fYear, fMonth, fDay;
+};
+
+// The processors of one kind.
+struct TProcessorKind {
+  std::string fKind;                    // such as "Example Processor"; empty when unknown
+  std::size_t fCount;                   // how many processors
+  std::optional<std::uint64_t> fCores;  // the enabled cores of all of them; none when any of them has an unknown number
+};
+
+struct TMemorySize {
+  std::uint64_t fBytes;         // of the modules of known size
+  std::size_t fModules;         // all modules
+  std::size_t fUnknownModules;  // those of them of unknown size; less than fModules
+};
+
+// The value of a row: a text, or data that a front end prints in its own way. Processors are sorted by kind, each kind once.
+using TReportValue = std::variant<std::string, TDate, std::vector<TProcessorKind>, TMemorySize>;
+using TReportAnswer = TAnswer<TReportValue>;
 
 struct TReportRow {
   std::string fKey;    // for programs: "serialNumber"
   std::string fLabel;  // for people: "Serial number"
-  TAnswer fAnswer;
+  TReportAnswer fAnswer;
 };
 
-// Which machine this is, as the providers tell it.
+// A report on the identity of this machine, or of the sample: rows with values or the reasons why they are missing. All values
+// of the identity are texts.
+//
+// A value that owns its rows; the views in fPlugIns share the namespaces of the plug-ins, which stay loaded until the process
+// ends. Several threads may read the rows; read the views from one thread at a time (TNamespaceView.h).
 struct TReport {
-  std::vector<std::string> fHead;  // two lines: the machine, its operating system
   std::vector<TReportRow> fIdentity;
-  std::vector<TReportRow> fDetails;
+  std::vector<TReportRow> fDetails;  // they do not count for the completeness
   std::vector<TPlugIn> fPlugIns;
+  std::optional<TSample> fSample;  // when the report is on a sample
+  std::string fTableFile;          // the file named by ZEP_SMBIOS_TABLE; empty when there is none, and for a sample
+  ECompleteness fCompleteness;
 
-  // Complete: every row of the identity is known, or does not apply to this machine, and no plug-in failed. Nothing: no row of
-  // the identity is known. The details do not count.
-  EExitStatus fStatus;
+  // The row of that key, of the identity or the details; null when there is none. It belongs to the report.
+  TReportRow const* FindRow(std::string const& key) const;
 };
 
-TReport MakeReport(std::vector<TPlugIn> plugIns);
+// Makes the report from the namespaces of the plug-ins (LoadPlugIns). `sample` is the one that was passed to LoadPlugIns, if
+// any. The first provider that knows a value gives it. A provider that fails makes its answers unknown, with the code
+// provider-failed; nothing that it throws is passed on. Without plug-ins every row is unknown. Blocks while providers answer.
+TReport MakeReport(std::vector<TPlugIn> plugIns, std::optional<TSample> sample = std::nullopt);
 
-// What is missing, and which plug-ins failed; empty when the report is complete.
-std::string WhyNotComplete(TReport const& report);
-
-std::string ReportAsText(TReport const& report);  // ReportText.cpp
-
-// A document, with every instance of every namespace besides; its exit status is the report's (ReportJson.cpp).
-TJson ReportAsJson(TReport const& report);
-
-// What a file with the report is called: "zep-report-db1-20261121T041530Z" and the extension. The host name is the report's own,
-// "unknown" when it has none, in characters that every file system takes; the time is now, in UTC (ReportFileName.cpp).
-std::string ReportFileName(TReport const& report, char const* extension);
-
-}  // namespace NQRVZEP20::zep
+}  // namespace NQRVZEP20

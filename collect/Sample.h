@@ -3,26 +3,29 @@
 
 #include <string>
 
-namespace NQRVZEP20::zep {
+namespace NQRVZEP20 {
 
-// The bundled sample: the SMBIOS table of an invented server, which providers read in place of this machine's.
+// A sample: the SMBIOS table of another machine, read instead of this machine's tables, and the label that keeps the two apart.
 //
-// Nothing that is printed then goes without a label: the sample's values say SAMPLE, and what the providers still know of
-// this machine (its operating system) says that it is not of the sample.
+// Pass it to LoadPlugIns and MakeReport. Every source of a value is then labelled: the sample's values bear the label, and
+// values that providers still read from this machine, such as its operating system, are marked "(not of the sample)".
+struct TSample {
+  std::string fTableFile;  // the path of the table, in the form that ZEP_SMBIOS_TABLE accepts
+  std::string fHostName;   // the host name to report; empty for this machine's own
+  std::string fLabel;      // such as "SAMPLE"; not empty
+};
 
-constexpr char const* kSampleLabel = "SAMPLE";
+// Makes providers read the sample, by setting the environment variables ZEP_SMBIOS_TABLE and ZEP_HOST_NAME of this process.
+// The variables stay set, because a provider may read them at any later time. LoadPlugIns calls this. Like every change of the
+// environment, it must not run beside other threads that read or change the environment.
+void SetForProviders(TSample const& sample);
 
-// From now on providers read the sample. To be called before they are loaded. Throws std::runtime_error when the sample
-// was not installed.
-void SelectSample();
+// The table file that the user named in ZEP_SMBIOS_TABLE, to be read instead of this machine's tables; empty when there is none.
+// After SetForProviders this is the sample's file.
+std::string NamedTableFile();
 
-bool IsSampleSelected();
+// The source of a value as it is to be printed. `label` is that of the sample, or empty without a sample: then the source is
+// returned unchanged.
+std::string LabelledSource(std::string const& source, std::string const& label);
 
-// The table file that the caller of zep has named in ZEP_SMBIOS_TABLE, in place of this machine's tables. Empty for none, and
-// for the sample.
-std::string TableFile();
-
-// Where a value comes from, as it is to be printed: with its label when the sample is selected, else as it is.
-std::string LabelledSource(std::string const& source);
-
-}  // namespace NQRVZEP20::zep
+}  // namespace NQRVZEP20

@@ -5,27 +5,18 @@
 #include "ICIMInstance.h"
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
-#include "ICIMQualifier.h"
 #include "TAddToVectorCallback.h"
 #include "TZEPException.h"
+#include "collect/SafeText.h"
 #include "collect/Sample.h"
-#include "tools/zep/output/Text.h"
 
 #include <algorithm>
 
-namespace NQRVZEP20::zep {
+namespace NQRVZEP20 {
 
 namespace {
 
 using TInstances = std::vector<boost::shared_ptr<ICIMInstance>>;
-
-// The text of a property; empty where there is no such property or no value.
-std::string TextOf(ICIMInstance const& instance, std::string const& name) {
-  auto const property = instance.GetProperty(name, TCIMContext());
-  if (!property) return "";
-  TCIMValue const value = property->GetValue(TCIMContext());
-  return value.IsNull() ? "" : value.ToString();
-}
 
 std::string PathIn(ICIMInstance const& instance) { return instance.GetPath(TCIMContext()).GetPath(); }
 
@@ -46,12 +37,11 @@ bool HaveSameValues(ICIMInstance const& one, ICIMInstance const& other) {
 
 }  // namespace
 
-TNamespaceView::TNamespaceView(std::string providerName, boost::shared_ptr<ICIMNamespace> ns)
-    : fProviderName(std::move(providerName)), fNamespace(std::move(ns)) {
-  for (auto const& missing : InstancesOf("ZEP_MissingValue"))
-    fMissing[{TextOf(*missing, "ElementPath"), TextOf(*missing, "ElementProperty")}] = {TextOf(*missing, "Code"),
-                                                                                        TextOf(*missing, "Reason")};
-}
+TNamespaceView::TNamespaceView(std::string providerName, boost::shared_ptr<ICIMNamespace> ns, std::string sampleLabel)
+    : fProviderName(std::move(providerName)),
+      fNamespace(std::move(ns)),
+      fSampleLabel(std::move(sampleLabel)),
+      fReasons(*fNamespace) {}
 
 std::string TNamespaceView::GetName() const { return fNamespace->GetName(TCIMContext()); }
 
@@ -88,7 +78,7 @@ std::string TNamespaceView::PathOf(ICIMInstance const& instance) const {
   return WithBytesEscaped(GetName() + ":" + path) + number;
 }
 
-// A provider may make a new object at each call: then the first one with the same values counts.
+// A provider may create a new object at each call. Then the first instance with the same values counts.
 std::size_t TNamespaceView::NumberOf(ICIMInstance const& instance, std::string const& className) const {
   auto const [place, isNew] = fWithoutKeys.try_emplace(className);
   TInstances& instances = place->second;
@@ -103,36 +93,38 @@ std::size_t TNamespaceView::NumberOf(ICIMInstance const& instance, std::string c
 }
 
 std::string TNamespaceView::SourceOf(ICIMPropertyDecl const& property) const {
-  auto const source = property.GetQualifier("ValueSource", TCIMContext());
-  return source ? LabelledSource(source->GetValue(TCIMContext()).ToString()) : "provider " + fProviderName;
+  auto const source = TReasonReader::SourceOf(property);
+  return source ? LabelledSource(*source, fSampleLabel) : "provider " + fProviderName;
 }
 
 TMissing TNamespaceView::WhyMissing(ICIMInstance const& instance, std::string const& property) const {
-  return WhyMissing(instance.GetPath(TCIMContext()).GetPath(), property, {kMissingNotGiven, "the provider gives no value"});
+  return fReasons.WhyMissing(instance, property).value_or(TMissing{kMissingNotGiven, "the provider gives no value"});
 }
 
 TMissing TNamespaceView::WhyNoInstance(std::string const& className) const {
-  return WhyMissing(className, "", {kMissingNotDescribed, "the provider describes none"});
+  return fReasons.WhyNoInstance(className).value_or(TMissing{kMissingNotDescribed, "the provider describes none"});
 }
 
-TAnswer TNamespaceView::Answer(ICIMInstance const& instance, std::string const& name) const {
+TAnswer<TCIMValue> TNamespaceView::Answer(ICIMInstance const& instance, std::string const& name) const {
+  using TValueAnswer = TAnswer<TCIMValue>;
   auto const property = instance.GetProperty(name, TCIMContext());
-  if (!property) return TAnswer::Unknown({kMissingNotGiven, "the provider knows no property " + name}, "");
+  if (!property) return TValueAnswer::Unknown({kMissingNotGiven, "the provider knows no property " + name}, "");
   std::string const source = SourceOf(*property->GetDeclaration(TCIMContext()));
   TCIMValue const value = property->GetValue(TCIMContext());
-  if (value.IsNull()) return TAnswer::Unknown(WhyMissing(instance, name), source);
-  return TAnswer::Known(value.ToString(), source);
+  if (value.IsNull()) return TValueAnswer::Unknown(WhyMissing(instance, name), source);
+  return TValueAnswer::Known(value, source);
 }
 
-TAnswer TNamespaceView::AnswerWithoutInstance(std::string const& className, std::string const& property) const {
+TAnswer<TCIMValue> TNamespaceView::AnswerOfFirst(std::string const& className, std::string const& property) const {
+  auto const instances = InstancesOf(className);
+  return instances.empty() ? AnswerWithoutInstance(className, property) : Answer(*instances.front(), property);
+}
+
+TAnswer<TCIMValue> TNamespaceView::AnswerWithoutInstance(std::string const& className, std::string const& property) const {
+  using TValueAnswer = TAnswer<TCIMValue>;
   auto const cls = FindClass(className);
-  if (!cls) return TAnswer::Unknown({kMissingNotDescribed, "no provider describes it"}, "");
-  return TAnswer::Unknown(WhyNoInstance(className), SourceOf(*cls->GetPropertyDecl(property, TCIMContext())));
+  if (!cls) return TValueAnswer::Unknown({kMissingNotDescribed, "no provider describes it"}, "");
+  return TValueAnswer::Unknown(WhyNoInstance(className), SourceOf(*cls->GetPropertyDecl(property, TCIMContext())));
 }
 
-TMissing TNamespaceView::WhyMissing(std::string const& path, std::string const& property, TMissing const& otherwise) const {
-  auto const found = fMissing.find({path, property});
-  return found != fMissing.end() ? found->second : otherwise;
-}
-
-}  // namespace NQRVZEP20::zep
+}  // namespace NQRVZEP20

@@ -110,6 +110,16 @@ TEST(ReadmeExampleTest, PrintsTheMachineTypeAndModelOfTheSample) {
   EXPECT_EQ(OutputOf(ZEP_README_EXAMPLE), "1234AB7\n");
 }
 
+// The environment in which the documentation runs PrintReport.
+std::string PrintedReport() {
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", ZEP_SOURCE_DIR "/tools/zep/sample/smbios.bin"), name("ZEP_HOST_NAME", "db1");
+  return OutputOf(ZEP_PRINT_REPORT "; echo $?");
+}
+
+TEST(PrintReportTest, PrintsTheIdentityAndTheMemoryOfTheSample) {
+  EXPECT_THAT(PrintedReport(), testing::MatchesRegex("Host name: db1\n(.*\n)*OS: (.*\n)*Memory: 128 GiB\n0\n"));
+}
+
 TEST(ListProviderTest, EndsInTheStatusOfAPlugInThatDoesNotLoad) {
   EXPECT_EQ(OutputOf(ZEP_LIST_PROVIDER " /nowhere/libNone.nsp.so 2>&1; echo $?"), "kZEPStatusFileSystemError\n1\n");
 }
@@ -179,6 +189,15 @@ TEST(DocumentationTest, WalkThroughShowsTheCodeOfTheExamples) {
   ExpectBlocksFrom(blocks, 6, 9, "examples/Batteries/Batteries.cpp");
   ExpectBlocksFrom("docs/writing-a-provider.md", "cmake", "examples/Clock/CMakeLists.txt", 1);
   EXPECT_EQ(FirstBlockOf("docs/writing-a-provider.md", "cmake"), SourceFile("examples/Clock/CMakeLists.txt"));
+}
+
+TEST(DocumentationTest, PageForFrontEndsShowsTheCodeOfTheExampleAndWhatItPrintsFirst) {
+  ExpectBlocksFrom("docs/writing-a-front-end.md", "cpp", "examples/PrintReport.cpp", 1);
+  std::string const command =
+      "$ ZEP_HOST_NAME=db1 ZEP_SMBIOS_TABLE=tools/zep/sample/smbios.bin build/release/examples/PrintReport\n";
+  std::string const shown = FirstBlockOf("docs/writing-a-front-end.md", "console");
+  ASSERT_THAT(shown, testing::StartsWith(command));
+  EXPECT_THAT(PrintedReport(), testing::StartsWith(shown.substr(command.size())));
 }
 
 TEST(DocumentationTest, PageOnSchemasShowsTheCodeOfTheExample) {

@@ -40,7 +40,7 @@ TRoom const kRooms[] = {
     {"providers/reasons", {"include", "providers/memory"}},
     {"providers/mof", {"include", "providers/memory"}},
     {"providers/host", {"include", "providers/memory", "providers/reasons", "platform/include"}},
-    {"collect", {"include", "providers/memory", "providers/mof", "providers/reasons", "tools/zep"}},
+    {"collect", {"include", "providers/memory", "providers/mof", "providers/reasons"}},
     {"tools/zep", {"include", "providers/memory", "providers/mof", "providers/reasons", "collect"}},
 };
 

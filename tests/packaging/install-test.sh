@@ -33,6 +33,8 @@ check() {  # check NAME PROGRAM
 cmake -G Ninja -S "$here/consumer" -B "$work/cmake" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/cmake.log"
 cmake --build "$work/cmake" >>"$work/cmake.log" || { cat "$work/cmake.log" >&2; exit 1; }
 check "the consumer built with CMake" "$work/cmake/consumer"
+ZEP_SMBIOS_TABLE=$work/prefix/share/zepcore/sample/smbios.bin "$work/cmake/report" >"$work/report"
+grep -qx 'Serial number: KQ12345' "$work/report" || { echo "the front end that uses collect printed:" >&2; cat "$work/report" >&2; exit 1; }
 
 export PKG_CONFIG_PATH
 PKG_CONFIG_PATH=$(dirname "$(find "$work/prefix" -name zepcore.pc)")

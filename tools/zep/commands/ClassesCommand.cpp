@@ -5,8 +5,8 @@
 #include "collect/ClassTree.h"
 #include "collect/MofFile.h"
 #include "collect/PlugIns.h"
-#include "collect/Sample.h"
 #include "tools/zep/commands/Commands.h"
+#include "tools/zep/commands/Providers.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"
@@ -31,7 +31,7 @@ struct TArguments {
 };
 
 struct TNamespaceClasses {
-  std::string fProvider, fNamespace;
+  std::string fProvider, fNamespace, fSampleLabel;
   std::vector<TClassEntry> fClasses;
 };
 
@@ -68,7 +68,7 @@ std::string AsText(std::vector<TNamespaceClasses> const& namespaces, bool asTree
   for (TNamespaceClasses const& ns : namespaces) {
     if (ns.fClasses.empty()) continue;
     std::string const count = std::to_string(ns.fClasses.size()) + (ns.fClasses.size() == 1 ? " class" : " classes");
-    std::string const label = IsSampleSelected() ? std::string(kSampleLabel) + " " : "";
+    std::string const label = ns.fSampleLabel.empty() ? "" : ns.fSampleLabel + " ";
     text += text.empty() ? "" : "\n";
     text += Printable(label + ns.fNamespace + " (" + ns.fProvider + "): " + count) + "\n\n";
     text += asTree ? TreeOf(ns.fClasses) : TableOf(ns.fClasses);
@@ -79,6 +79,7 @@ std::string AsText(std::vector<TNamespaceClasses> const& namespaces, bool asTree
 struct TClasses {
   std::vector<TNamespaceClasses> fNamespaces;
   std::vector<std::string> fFailures;  // of the providers
+  std::string fSampleLabel;            // empty without a sample
 
   bool IsEmpty() const {
     return std::all_of(fNamespaces.begin(), fNamespaces.end(), [](TNamespaceClasses const& ns) { return ns.fClasses.empty(); });
@@ -94,7 +95,7 @@ struct TClasses {
 };
 
 std::string AsJson(TClasses const& found) {
-  TJson document = DocumentHead("zep classes", found.ExitStatus(), Joined(found.Reasons(), "; "));
+  TJson document = DocumentHead("zep classes", found.ExitStatus(), Joined(found.Reasons(), "; "), found.fSampleLabel);
   document["namespaces"] = TJson::array();
   for (TNamespaceClasses const& ns : found.fNamespaces) {
     TJson classes = TJson::array();
@@ -113,11 +114,13 @@ std::string AsJson(TClasses const& found) {
 TClasses FindClasses(TArguments const& arguments) {
   TClasses classes;
   bool const isMof = !arguments.fMofFile.empty();
-  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugIns();
+  auto const sample = SampleIf(arguments.fSample);
+  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugInsQuietly(sample);
+  classes.fSampleLabel = sample ? sample->fLabel : "";
   classes.fFailures = FailuresOf(plugIns);
   for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
     std::string const failure = FailureOf([&] {
-      classes.fNamespaces.push_back({view.GetProviderName(), view.GetName(), ClassesOf(*view.Get())});
+      classes.fNamespaces.push_back({view.GetProviderName(), view.GetName(), view.GetSampleLabel(), ClassesOf(*view.Get())});
     });
     if (!failure.empty()) classes.fFailures.push_back(view.GetProviderName() + ": " + failure);
   }
@@ -125,7 +128,6 @@ TClasses FindClasses(TArguments const& arguments) {
 }
 
 int Classes(TArguments const& arguments) {
-  if (arguments.fSample) SelectSample();
   TClasses const classes = FindClasses(arguments);
   WriteOutput(arguments.fAsJson ? AsJson(classes) : AsText(classes.fNamespaces, arguments.fAsTree));
   for (std::string const& reason : classes.Reasons()) std::cerr << "zep: " << Printable(reason) << "\n";

@@ -77,7 +77,7 @@ private:
   bool IsIndication(ICIMClass const& cls) {
     auto const superClass = cls.GetSuperClass(TCIMContext());
     bool const isBelowOne = superClass && fIndicationNames.count(superClass->GetName(TCIMContext())) != 0;
-    if (!isBelowOne && !IsSet(cls, "Indication")) return false;
+    if (!isBelowOne && !HasSetQualifier(cls, "Indication")) return false;
     fIndicationNames.insert(cls.GetName(TCIMContext()));
     return true;
   }

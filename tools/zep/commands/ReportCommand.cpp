@@ -3,13 +3,17 @@
 // zep report: which machine this is.
 
 #include "collect/Report.h"
-#include "collect/Sample.h"
 #include "tools/zep/commands/Commands.h"
+#include "tools/zep/commands/Providers.h"
 #include "tools/zep/media/TMountedMedium.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"
+#include "tools/zep/output/ReportJson.h"
+#include "tools/zep/output/ReportPhrases.h"
+#include "tools/zep/output/ReportText.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/processes/Interrupts.h"
+#include "tools/zep/transfer/ReportFileName.h"
 #include "tools/zep/transfer/SendReport.h"
 
 #include <CLI/CLI.hpp>
@@ -59,7 +63,7 @@ TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
   TMountedMedium const medium(arguments.fMedium);
   std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);
 
-  TJson document = DocumentHead(kToMedia, report.fStatus, WhyNotComplete(report));
+  TJson document = DocumentHead(kToMedia, ExitStatusOf(report.fCompleteness), WhyNotComplete(report), SampleLabelOf(report));
   document["device"] = medium.Device();
   document["file"] = name;
   document["bytes"] = text.size();
@@ -91,14 +95,10 @@ void AddSending(TJson& document, TSentReport const& sent) {
                       {"keptIn", OrNull(sent.fKeptIn)}};
 }
 
-// The JSON document is printed at the end, as it tells what zep ends with.
-int MakeAndDeliver(TArguments const& arguments) {
-  TTarget target{};
-  if (!arguments.fTarget.empty()) target = TargetOf(arguments.fTarget, arguments.fBySftp);
-  if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
-  if (arguments.fSample) SelectSample();
-  TReport const report = MakeReport(LoadPlugIns());
-  EExitStatus status = report.fStatus;
+// Prints or stores the report, and sends it if that was requested. The JSON document is printed last, because it contains the
+// exit status.
+int Deliver(TReport const& report, TTarget const& target, TArguments const& arguments) {
+  EExitStatus status = ExitStatusOf(report.fCompleteness);
   TJson document = PrintOrWrite(report, arguments);
   std::optional<TInterruptGuard> guard;
   if (!arguments.fTarget.empty()) {
@@ -112,11 +112,15 @@ int MakeAndDeliver(TArguments const& arguments) {
 }
 
 int Report(TArguments const& arguments) {
+  std::optional<TSample> sample;
   try {
-    return MakeAndDeliver(arguments);
+    TTarget const target = arguments.fTarget.empty() ? TTarget{} : TargetOf(arguments.fTarget, arguments.fBySftp);
+    if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
+    sample = SampleIf(arguments.fSample);
+    return Deliver(MakeReport(LoadPlugInsQuietly(sample), sample), target, arguments);
   } catch (std::exception const& failure) {
     bool const isOfMedium = !arguments.fMedium.empty() && arguments.fAsJson && !HasWrittenOutput();
-    if (isOfMedium) WriteOutput(FailureAsJson(kToMedia, StatusOf(failure), failure.what()));
+    if (isOfMedium) WriteOutput(FailureAsJson(kToMedia, StatusOf(failure), failure.what(), sample ? sample->fLabel : ""));
     throw;
   }
 }

@@ -13,9 +13,9 @@
 #include "TZEPException.h"
 #include "collect/MofFile.h"
 #include "collect/PlugIns.h"
-#include "collect/Sample.h"
-#include "collect/ValueWords.h"
+#include "collect/TValueWords.h"
 #include "tools/zep/commands/Commands.h"
+#include "tools/zep/commands/Providers.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"
@@ -83,8 +83,9 @@ boost::shared_ptr<ICIMElement> Find(TNamespaceView const& view, std::string cons
   return printed ? printed : element;
 }
 
-std::string Heading(std::string const& what) {
-  return Printable(IsSampleSelected() ? std::string(kSampleLabel) + " " + what : what) + "\n\n";
+std::string Heading(TNamespaceView const& view, std::string const& text) {
+  std::string const& label = view.GetSampleLabel();
+  return Printable(label.empty() ? text : label + " " + text) + "\n\n";
 }
 
 std::string InstanceAsText(TNamespaceView const& view, ICIMInstance const& instance) {
@@ -100,7 +101,7 @@ std::string InstanceAsText(TNamespaceView const& view, ICIMInstance const& insta
         return true;
       },
       TCIMContext());
-  return Heading(view.PathOf(instance)) + table.GetText();
+  return Heading(view, view.PathOf(instance)) + table.GetText();
 }
 
 // The class and those above it, the topmost first.
@@ -202,7 +203,7 @@ std::string ClassAsText(TNamespaceView const& view, boost::shared_ptr<ICIMClass 
                TValueWords(property).TextOf(property.GetDefaultValue(TCIMContext()))});
   });
 
-  std::string text = Heading(heading) + DescriptionOf(*cls) + table.GetText() + ValuesAsText(*cls, lineage) +
+  std::string text = Heading(view, heading) + DescriptionOf(*cls) + table.GetText() + ValuesAsText(*cls, lineage) +
                      MethodsAsText(lineage) + "\nInstances\n";
   auto const instances = view.InstancesOf(name);
   for (auto const& instance : instances) text += Printable(view.PathOf(*instance)) + "\n";
@@ -256,7 +257,7 @@ std::string ElementAsText(TNamespaceView const& view, boost::shared_ptr<ICIMElem
 }
 
 std::string ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElement> const& element) {
-  TJson document = DocumentHead("zep show", kExitComplete, "");
+  TJson document = DocumentHead("zep show", kExitComplete, "", view.GetSampleLabel());
   document["object"] = ForElement(
       element, [&](ICIMInstance const& instance) { return InstanceAsJson(view, instance); },
       [&](boost::shared_ptr<ICIMClass const> cls) { return ClassAsJson(view, cls); });
@@ -268,10 +269,10 @@ struct TSearch {
   std::vector<std::string> fFailures;  // of the providers
 };
 
-TSearch Search(TArguments const& arguments) {
+TSearch Search(TArguments const& arguments, std::optional<TSample> const& sample) {
   TSearch search;
   bool const isMof = !arguments.fMofFile.empty();
-  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugIns();
+  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugInsQuietly(sample);
   search.fFailures = FailuresOf(plugIns);
   for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
     std::string const failure = FailureOf([&] {
@@ -285,8 +286,8 @@ TSearch Search(TArguments const& arguments) {
 }
 
 int Show(TArguments const& arguments) {
-  if (arguments.fSample) SelectSample();
-  TSearch search = Search(arguments);
+  auto const sample = SampleIf(arguments.fSample);
+  TSearch search = Search(arguments, sample);
   if (!search.fText.empty()) {
     WriteOutput(search.fText);
     return kExitComplete;
@@ -294,7 +295,8 @@ int Show(TArguments const& arguments) {
   std::vector<std::string>& reasons = search.fFailures;
   reasons.push_back((arguments.fMofFile.empty() ? "no provider has the" : arguments.fMofFile + " has no") + " object \"" +
                     arguments.fPath + "\"");
-  if (arguments.fAsJson) WriteOutput(FailureAsJson("zep show", kExitNothing, Joined(reasons, "; ")));
+  if (arguments.fAsJson)
+    WriteOutput(FailureAsJson("zep show", kExitNothing, Joined(reasons, "; "), sample ? sample->fLabel : ""));
   for (std::string const& reason : reasons) std::cerr << "zep: " << Printable(reason) << "\n";
   return kExitNothing;
 }

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "collect/ECompleteness.h"
+
 namespace NQRVZEP20::zep {
 
 // What zep ends with, whatever the command. docs/formats.md has the table.
@@ -22,6 +24,17 @@ enum EExitStatus {
   kExitInterrupt = 130,
   kExitTermination = 143
 };
+
+inline EExitStatus ExitStatusOf(ECompleteness completeness) {
+  switch (completeness) {
+    case ECompleteness::kComplete:
+      return kExitComplete;
+    case ECompleteness::kPartial:
+      return kExitPartial;
+    default:
+      return kExitNothing;
+  }
+}
 
 // For programs: what it says of what was asked for. Every failure is "nothing".
 inline char const* NameOf(EExitStatus status) {

@@ -5,8 +5,7 @@
 #include "ICIMInstance.h"
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
-#include "collect/Sample.h"
-#include "collect/ValueWords.h"
+#include "collect/TValueWords.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/secrets/Secrets.h"
 
@@ -70,9 +69,9 @@ TJson WithoutSecretsIn(TJson json, bool isMessage = false) {
 
 }  // namespace
 
-TJson DocumentHead(std::string const& what, EExitStatus status, std::string const& reason) {
-  TJson document = {{"document", what}, {"version", kDocumentVersion}, {"zep", ZEP_VERSION}, {"sample", IsSampleSelected()}};
-  if (IsSampleSelected()) document["label"] = kSampleLabel;
+TJson DocumentHead(std::string const& what, EExitStatus status, std::string const& reason, std::string const& sampleLabel) {
+  TJson document = {{"document", what}, {"version", kDocumentVersion}, {"zep", ZEP_VERSION}, {"sample", !sampleLabel.empty()}};
+  if (!sampleLabel.empty()) document["label"] = sampleLabel;
   document["exitStatus"] = static_cast<int>(status);
   document["reason"] = OrNull(reason);
   return document;
@@ -88,8 +87,9 @@ std::string AsLine(TJson const& document) {
 
 TJson OrNull(std::string const& text) { return text.empty() ? TJson(nullptr) : TJson(text); }
 
-std::string FailureAsJson(std::string const& what, EExitStatus status, std::string const& reason) {
-  return AsLine(DocumentHead(what, status, reason));
+std::string FailureAsJson(std::string const& what, EExitStatus status, std::string const& reason,
+                          std::string const& sampleLabel) {
+  return AsLine(DocumentHead(what, status, reason, sampleLabel));
 }
 
 TJson ValueAsJson(TCIMValue const& value) {

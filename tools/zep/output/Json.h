@@ -19,9 +19,10 @@ using TJson = nlohmann::ordered_json;
 // The version of the documents that zep prints. It grows when a program that reads them would notice.
 constexpr int kDocumentVersion = 2;
 
-// The head that every document has: what it is, its version, whether it is about the sample, what zep ends with, and why that
-// is not kExitComplete. The reason is empty for kExitComplete, and for nothing else.
-TJson DocumentHead(std::string const& what, EExitStatus status, std::string const& reason);
+// The head of every document: what it is, its version, whether it is about the sample, the exit status, and why that is not
+// kExitComplete. The reason is empty for kExitComplete, and only then. `sampleLabel` is the label of the sample that the document
+// is about; empty for none.
+TJson DocumentHead(std::string const& what, EExitStatus status, std::string const& reason, std::string const& sampleLabel = "");
 
 // A document as text, in lines for people or in one line. Bytes that are not UTF-8 become the replacement character. Members that
 // hold a message, such as "reason", or repeat an argument, such as "url", hide passwords (Secrets.h); all others are data.
@@ -35,7 +36,8 @@ std::string AsVerbatimText(TJson const& document);
 TJson OrNull(std::string const& text);
 
 // The document of a command that failed before it had one of its own: the head alone, in one line.
-std::string FailureAsJson(std::string const& what, EExitStatus status, std::string const& reason);
+std::string FailureAsJson(std::string const& what, EExitStatus status, std::string const& reason,
+                          std::string const& sampleLabel = "");
 
 // Booleans and numbers become their JSON kinds, arrays arrays, NULL null, and all others their text. So do integers of 64 bits,
 // which many programs read as reals of 53 bits, and a real that is not finite.

@@ -1,10 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "collect/Report.h"
+#include "tools/zep/output/ReportJson.h"
 
 #include "ICIMInstance.h"
-#include "collect/Sample.h"
-#include "tools/zep/output/Failure.h"
-#include "tools/zep/output/Json.h"
+#include "collect/FailureOf.h"
+#include "tools/zep/output/ReportPhrases.h"
 
 namespace NQRVZEP20::zep {
 
@@ -13,12 +12,12 @@ namespace {
 TJson RowsAsJson(std::vector<TReportRow> const& rows) {
   TJson json = TJson::object();
   for (TReportRow const& row : rows) {
-    TAnswer const& answer = row.fAnswer;
+    TReportAnswer const& answer = row.fAnswer;
     TJson& entry = json[row.fKey] = {{"label", row.fLabel}, {"value", nullptr}, {"source", nullptr}};
-    if (answer.fIsKnown) entry["value"] = answer.fValue;
+    if (answer.IsKnown()) entry["value"] = ValueText(*answer.fValue);
     if (!answer.fSource.empty()) entry["source"] = answer.fSource;
     if (!answer.fNote.empty()) entry["note"] = answer.fNote;
-    if (!answer.fIsKnown) entry["code"] = answer.fMissing.fCode, entry["reason"] = answer.fMissing.fReason;
+    if (!answer.IsKnown()) entry["code"] = answer.fMissing.fCode, entry["reason"] = answer.fMissing.fReason;
   }
   return json;
 }
@@ -57,10 +56,11 @@ void AddInstances(TJson& document, std::vector<TPlugIn> const& plugIns) {
 }  // namespace
 
 TJson ReportAsJson(TReport const& report) {
-  TJson document = DocumentHead("zep report", report.fStatus, WhyNotComplete(report));
-  document["status"] = NameOf(report.fStatus);
-  document["head"] = report.fHead;
-  document["smbiosTableFile"] = OrNull(TableFile());
+  EExitStatus const status = ExitStatusOf(report.fCompleteness);
+  TJson document = DocumentHead("zep report", status, WhyNotComplete(report), SampleLabelOf(report));
+  document["status"] = NameOf(status);
+  document["head"] = HeadLines(report);
+  document["smbiosTableFile"] = OrNull(report.fTableFile);
   document["identity"] = RowsAsJson(report.fIdentity);
   document["details"] = RowsAsJson(report.fDetails);
   document["plugInDirectory"] = PlugInDirectory();

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "collect/Report.h"
-#include "collect/Sample.h"
+#include "tools/zep/output/ReportText.h"
+
+#include "tools/zep/output/ReportPhrases.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/secrets/Secrets.h"
 
@@ -10,18 +11,16 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-std::string Title(std::string const& title) { return IsSampleSelected() ? std::string(kSampleLabel) + " " + title : title; }
-
-std::string ValueOf(TAnswer const& answer) {
-  if (answer.fIsKnown) return answer.fValue + (answer.fNote.empty() ? "" : " (" + answer.fNote + ")");
+std::string ValueOf(TReportAnswer const& answer) {
+  if (answer.IsKnown()) return ValueText(*answer.fValue) + (answer.fNote.empty() ? "" : " (" + answer.fNote + ")");
   return (answer.IsNotApplicable() ? "none: " : "unknown: ") + MessageWithoutSecrets(answer.fMissing.fReason);
 }
 
 std::string RowsAsText(std::string const& title, std::vector<TReportRow> const& rows) {
   TTable table({15, 36, 25});
-  table.Add({Title(title), "Value", "Source"});
+  table.Add({title, "Value", "Source"});
   for (TReportRow const& row : rows) {
-    TAnswer const& answer = row.fAnswer;
+    TReportAnswer const& answer = row.fAnswer;
     table.Add({row.fLabel, ValueOf(answer), answer.fSource.empty() ? "none" : answer.fSource});
   }
   return table.GetText();
@@ -33,7 +32,7 @@ std::string AsMilliseconds(double milliseconds) {
   return text;
 }
 
-std::string WhatHappened(TPlugIn const& plugIn) {
+std::string ResultOf(TPlugIn const& plugIn) {
   if (!plugIn.fError.empty()) return "failed: " + MessageWithoutSecrets(plugIn.fError);
   if (plugIn.fProviders.empty()) return "loaded, but registered no provider of its own";
   std::string text;
@@ -45,13 +44,13 @@ std::string WhatHappened(TPlugIn const& plugIn) {
   return text;
 }
 
-std::string PlugInsAsText(std::vector<TPlugIn> const& plugIns) {
+std::string PlugInsAsText(std::string const& title, std::vector<TPlugIn> const& plugIns) {
   TTable table({15, 10, 51});
-  table.Add({Title("Plug-in"), "Time", "Result"});
+  table.Add({title, "Time", "Result"});
   for (TPlugIn const& plugIn : plugIns) {
     double milliseconds = plugIn.fMilliseconds;
     for (TProviderRun const& provider : plugIn.fProviders) milliseconds += provider.fMilliseconds;
-    table.Add({plugIn.fName, AsMilliseconds(milliseconds), WhatHappened(plugIn)});
+    table.Add({plugIn.fName, AsMilliseconds(milliseconds), ResultOf(plugIn)});
   }
   if (plugIns.empty()) table.Add({"none", "0.0 ms", "no file lib*.nsp.so in " + PlugInDirectory()});
   return table.GetText();
@@ -60,11 +59,13 @@ std::string PlugInsAsText(std::vector<TPlugIn> const& plugIns) {
 }  // namespace
 
 std::string ReportAsText(TReport const& report) {
+  std::string const label = LabelPrefixOf(report);
   std::string text;
-  for (std::string const& line : report.fHead) text += Printable(line) + "\n";
-  if (!TableFile().empty()) text += Printable("SMBIOS tables read from the file " + TableFile() + " (ZEP_SMBIOS_TABLE)") + "\n";
-  return text + "\n" + RowsAsText("Identity", report.fIdentity) + "\n" + RowsAsText("Details", report.fDetails) + "\n" +
-         PlugInsAsText(report.fPlugIns);
+  for (std::string const& line : HeadLines(report)) text += Printable(line) + "\n";
+  if (!report.fTableFile.empty())
+    text += Printable("SMBIOS tables read from the file " + report.fTableFile + " (ZEP_SMBIOS_TABLE)") + "\n";
+  return text + "\n" + RowsAsText(label + "Identity", report.fIdentity) + "\n" + RowsAsText(label + "Details", report.fDetails) +
+         "\n" + PlugInsAsText(label + "Plug-in", report.fPlugIns);
 }
 
 }  // namespace NQRVZEP20::zep

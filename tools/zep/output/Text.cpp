@@ -3,7 +3,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <cstdio>
 #include <iterator>
 #include <numeric>
 #include <optional>
@@ -11,60 +10,6 @@
 namespace NQRVZEP20::zep {
 
 namespace {
-
-struct TCharacter {
-  std::uint32_t code;
-  std::size_t size;  // in bytes; 0 for a byte that begins no UTF-8 character
-};
-
-// The character that the text, which is not empty, begins with.
-TCharacter FirstOf(std::string_view text) {
-  auto const byte = [&](std::size_t at) { return static_cast<unsigned char>(text[at]); };
-  if (byte(0) < 0x80) return {byte(0), 1};
-  std::size_t const size = byte(0) >= 0xf0 ? 4 : byte(0) >= 0xe0 ? 3 : 2;
-  if (byte(0) < 0xc2 || byte(0) > 0xf4 || text.size() < size) return {byte(0), 0};
-
-  std::uint32_t code = byte(0) & (0xff >> (size + 1));
-  for (std::size_t at = 1; at < size; ++at) {
-    if ((byte(at) & 0xc0) != 0x80) return {byte(0), 0};
-    code = code << 6 | (byte(at) & 0x3f);
-  }
-  constexpr std::uint32_t smallest[] = {0, 0, 0x80, 0x800, 0x10000};
-  bool const isSurrogate = code >= 0xd800 && code <= 0xdfff;
-  if (code < smallest[size] || code > 0x10ffff || isSurrogate) return {byte(0), 0};
-  return {code, size};
-}
-
-// Characters that a terminal acts upon, or that show text other than it is.
-bool IsHarmful(std::uint32_t code) {
-  bool const isControl = code < 0x20 || (code >= 0x7f && code < 0xa0);
-  bool const isDirection = code == 0x061c || (code >= 0x200b && code <= 0x200f) || (code >= 0x2028 && code <= 0x202e) ||
-                           (code >= 0x2060 && code <= 0x206f) || code == 0xfeff;
-  return isControl || isDirection;
-}
-
-std::string Escaped(std::uint32_t code) {
-  char text[12];
-  std::snprintf(text, sizeof text, code < 0x100 ? "\\x%02x" : "\\u%04x", static_cast<unsigned>(code));
-  return text;
-}
-
-// The text with those of its characters escaped that `isToBeEscaped`.
-template <class TIsToBeEscaped>
-std::string WithEscaped(std::string_view text, TIsToBeEscaped isToBeEscaped) {
-  std::string escaped;
-  escaped.reserve(4 * text.size());  // "\\xff"; a secret leaves no piece elsewhere
-  while (!text.empty()) {
-    TCharacter const first = FirstOf(text);
-    std::size_t const size = std::max<std::size_t>(first.size, 1);
-    if (isToBeEscaped(first))
-      escaped += Escaped(first.code);
-    else
-      escaped += text.substr(0, size);
-    text.remove_prefix(size);
-  }
-  return escaped;
-}
 
 std::string WithoutTrailingBlanks(std::string_view text) { return std::string(text.substr(0, text.find_last_not_of(' ') + 1)); }
 
@@ -80,7 +25,7 @@ bool IsWiderThan(std::string_view text, std::size_t width) {
 std::size_t BreakOf(std::string_view text, std::size_t width) {
   std::size_t end = 0;
   for (std::size_t characters = 0; characters < width; ++characters)
-    end += std::max<std::size_t>(FirstOf(text.substr(end)).size, 1);
+    end += std::max<std::size_t>(FirstCharacterOf(text.substr(end)).fSize, 1);
   std::size_t const blank = text.find_last_of(' ', end);
   return blank != text.npos && text.find_first_not_of(' ') < blank ? blank : end;
 }
@@ -132,14 +77,6 @@ void Widen(TWidths& widths, TWidths const& wanted, std::size_t lineWidth) {
 }
 
 }  // namespace
-
-std::string Printable(std::string_view text) {
-  return WithEscaped(text, [](TCharacter const& character) { return character.size == 0 || IsHarmful(character.code); });
-}
-
-std::string WithBytesEscaped(std::string_view text) {
-  return WithEscaped(text, [](TCharacter const& character) { return character.size == 0 || character.code == 0; });
-}
 
 std::size_t WidthOf(std::string_view text) {
   return static_cast<std::size_t>(

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "collect/SafeText.h"
 #include "tools/zep/output/Terminal.h"
 
 #include <cstdint>
@@ -9,14 +10,6 @@
 #include <vector>
 
 namespace NQRVZEP20::zep {
-
-// Text that is safe on a terminal. What comes from firmware or a plug-in may hold anything: control characters, characters
-// that change the direction of writing, and bytes that are no UTF-8 are written as "\x1b" or "\u202e".
-std::string Printable(std::string_view text);
-
-// The same text, with each zero byte and each byte that is no UTF-8 written as "\x00" or "\xff". Other characters stay, control
-// characters among them.
-std::string WithBytesEscaped(std::string_view text);
 
 // How many characters a printable text has. Each counts as one column.
 std::size_t WidthOf(std::string_view text);

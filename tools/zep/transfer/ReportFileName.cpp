@@ -1,5 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "collect/Report.h"
+#include "tools/zep/transfer/ReportFileName.h"
+
+#include "tools/zep/output/ReportPhrases.h"
 
 #include <algorithm>
 #include <cctype>
@@ -12,9 +14,8 @@ namespace {
 constexpr std::size_t kLongestHostName = 64;
 
 std::string HostNameIn(TReport const& report) {
-  for (TReportRow const& row : report.fIdentity)
-    if (row.fKey == "hostName" && row.fAnswer.fIsKnown) return row.fAnswer.fValue;
-  return "unknown";
+  TReportRow const* const row = report.FindRow("hostName");
+  return row != nullptr && row->fAnswer.IsKnown() ? ValueText(*row->fAnswer.fValue) : "unknown";
 }
 
 std::string Cleaned(std::string host) {

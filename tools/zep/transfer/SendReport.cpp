@@ -2,9 +2,11 @@
 #include "tools/zep/transfer/SendReport.h"
 
 #include "tools/zep/output/Failure.h"
+#include "tools/zep/output/ReportJson.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/processes/TScratchDirectory.h"
 #include "tools/zep/transfer/Gzip.h"
+#include "tools/zep/transfer/ReportFileName.h"
 
 #include <cerrno>
 #include <fstream>

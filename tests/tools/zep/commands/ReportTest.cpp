@@ -536,7 +536,7 @@ TEST_F(ReportTest, AProviderThatFailsIsToldAndStopsNoOther) {
     char const *behaviour, *result;
   } const rows[] = {
       {"throws", "provider Test failed: kZEPStatusAccessDenied"},
-      {"throws-a-number", "provider Test failed: it threw something that is no exception of the standard library"},
+      {"throws-a-number", "provider Test failed: it threw something that is not a std::exception"},
       {"no-namespace", "provider Test failed: it has no namespace"},
       {"fails-at-once", "provider Test failed: kZEPStatusFail"},
   };
@@ -573,7 +573,7 @@ TEST_F(ReportTest, ANamespaceThatFailsLaterIsToldWhereItFails) {
   auto const document = JsonOf(RunWithTestProvider("fails-later", {"--json"}));
   EXPECT_THAT(document["instances"], IsEmpty());
   EXPECT_EQ(document["instanceFailures"][0]["provider"], "Test");
-  EXPECT_EQ(document["instanceFailures"][0]["error"], "it threw something that is no exception of the standard library");
+  EXPECT_EQ(document["instanceFailures"][0]["error"], "it threw something that is not a std::exception");
 }
 
 TEST_F(ReportTest, APlugInThatRegistersNothingIsTold) {

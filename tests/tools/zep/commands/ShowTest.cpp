@@ -194,7 +194,7 @@ TEST_F(ShowTest, AProviderThatFailedIsNamed) {
 TEST_F(ShowTest, ClassesNamesANamespaceThatFailsAndShowsTheOthers) {
   TRun const run = Run({"classes", "--json"}, "fails-later");
   EXPECT_EQ(run.status, 2);
-  EXPECT_EQ(run.errors, "zep: Test: it threw something that is no exception of the standard library\n");
+  EXPECT_EQ(run.errors, "zep: Test: it threw something that is not a std::exception\n");
   EXPECT_EQ(JsonOf(run)["namespaces"].size(), 1u);
 }
 

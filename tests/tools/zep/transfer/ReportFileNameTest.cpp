@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "collect/Report.h"
+#include "tools/zep/transfer/ReportFileName.h"
 
 #include "tests/Support.h"
 
@@ -10,23 +10,23 @@
 namespace NQRVZEP20::zep {
 namespace {
 
-TReport ReportOn(TAnswer const& hostName) {
+TReport ReportOn(TReportAnswer const& hostName) {
   TReport report{};
-  report.fIdentity = {{"productName", "Product name", TAnswer::Known("Server", "")}, {"hostName", "Host name", hostName}};
+  report.fIdentity = {{"productName", "Product name", TReportAnswer::Known("Server", "")}, {"hostName", "Host name", hostName}};
   return report;
 }
 
 TEST(ReportFileNameTest, BearsTheHostNameOfTheReport) {
   struct TRow {
-    TAnswer hostName;
+    TReportAnswer hostName;
     std::string inName;
   };
   TRow const rows[] = {
-      {TAnswer::Known("db1", ""), "db1"},
-      {TAnswer::Known("DB-1.example.com", ""), "DB-1_example_com"},
-      {TAnswer::Known("../a b\xc3\xa4\n", ""), "___a_b___"},
-      {TAnswer::Known(std::string(100, 'x'), ""), std::string(64, 'x')},
-      {TAnswer::Unknown({}, ""), "unknown"},
+      {TReportAnswer::Known("db1", ""), "db1"},
+      {TReportAnswer::Known("DB-1.example.com", ""), "DB-1_example_com"},
+      {TReportAnswer::Known("../a b\xc3\xa4\n", ""), "___a_b___"},
+      {TReportAnswer::Known(std::string(100, 'x'), ""), std::string(64, 'x')},
+      {TReportAnswer(), "unknown"},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.inName);
@@ -40,7 +40,7 @@ TEST(ReportFileNameTest, BearsTheTimeInUtc) {
   TEnvironmentGuard const zone("TZ", "EAST-5");
   ::tzset();
   std::time_t const before = std::time(nullptr);
-  std::string const name = ReportFileName(ReportOn(TAnswer::Known("db1", "")), ".json");
+  std::string const name = ReportFileName(ReportOn(TReportAnswer::Known("db1", "")), ".json");
   std::tm fields{};
   ASSERT_NE(::strptime(name.c_str(), "zep-report-db1-%Y%m%dT%H%M%SZ.json", &fields), nullptr) << name;
   std::time_t const told = ::timegm(&fields);

@@ -2,6 +2,7 @@
 #include "tools/zep/transfer/SendReport.h"
 
 #include "tests/Support.h"
+#include "tools/zep/output/ReportJson.h"
 #include "tools/zep/transfer/Gzip.h"
 
 #include <gmock/gmock.h>

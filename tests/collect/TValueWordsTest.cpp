@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "collect/ValueWords.h"
+#include "collect/TValueWords.h"
 
 #include "ICIMClass.h"
 #include "ICIMPropertyDecl.h"
@@ -9,12 +9,12 @@
 #include <gtest/gtest.h>
 #include <boost/make_shared.hpp>
 
-namespace NQRVZEP20::zep {
+namespace NQRVZEP20 {
 namespace {
 
 using TType = TCIMValue::TCIMType;
 
-class ValueWordsTest : public testing::Test {
+class TValueWordsTest : public testing::Test {
 protected:
   // The words of the property P that the function describes.
   TValueWords Words(std::vector<std::string> const& values, std::vector<std::string> const& words, char const* type = "uint16") {
@@ -33,7 +33,7 @@ protected:
 
 TCIMValue Uint16(int value) { return TCIMValue(static_cast<unsigned short>(value)); }
 
-TEST_F(ValueWordsTest, AValueIsPrintedWithItsWord) {
+TEST_F(TValueWordsTest, AValueIsPrintedWithItsWord) {
   TValueWords const words = Words({"0", "2", "5"}, {"Unknown", "Degraded", "OK"});
   EXPECT_EQ(words.TextOf(Uint16(5)), "5 (OK)");
   EXPECT_EQ(words.TextOf(Uint16(3)), "3");
@@ -42,7 +42,7 @@ TEST_F(ValueWordsTest, AValueIsPrintedWithItsWord) {
             "{ 2 (Degraded), 1, NULL }");
 }
 
-TEST_F(ValueWordsTest, RangesHaveAWordToo) {
+TEST_F(TValueWordsTest, RangesHaveAWordToo) {
   TValueWords const words =
       Words({"..7", "9", "10..20", "15", "0x8000..0xFFFF", ".."}, {"low", "nine", "teens", "never", "vendor", "rest"});
   struct TRow {
@@ -54,7 +54,7 @@ TEST_F(ValueWordsTest, RangesHaveAWordToo) {
     EXPECT_EQ(words.WordFor(Uint16(row.value)), row.word) << row.value;
 }
 
-TEST_F(ValueWordsTest, NumbersAreComparedAsNumbersToTheirLastDigit) {
+TEST_F(TValueWordsTest, NumbersAreComparedAsNumbersToTheirLastDigit) {
   TValueWords const words =
       Words({"-5..-1", "0x10", "18446744073709551615", "9007199254740993.."}, {"below", "sixteen", "most", "large"}, "uint64");
   EXPECT_EQ(words.WordFor(TCIMValue(-3)), "below");
@@ -64,30 +64,30 @@ TEST_F(ValueWordsTest, NumbersAreComparedAsNumbersToTheirLastDigit) {
   EXPECT_EQ(words.WordFor(TCIMValue(9007199254740992ul)), "");
 }
 
-TEST_F(ValueWordsTest, EntriesThatMakeNoSenseAreNoEntries) {
+TEST_F(TValueWordsTest, EntriesThatMakeNoSenseAreNoEntries) {
   TValueWords const words = Words({"", "x", "1..x", "..x", "5.", "99999999999999999999"}, {"a", "b", "c", "d", "e", "f"});
   for (int const value : {0, 1, 2, 5, 9}) EXPECT_EQ(words.WordFor(Uint16(value)), "") << value;
 }
 
-TEST_F(ValueWordsTest, TextsAreComparedAsTexts) {
+TEST_F(TValueWordsTest, TextsAreComparedAsTexts) {
   TValueWords const words = Words({"on", "off"}, {"Running", "Stopped"}, "string");
   EXPECT_EQ(words.TextOf(TCIMValue("on")), "on (Running)");
   EXPECT_EQ(words.TextOf(TCIMValue("ON")), "ON");
 }
 
-TEST_F(ValueWordsTest, WithoutValueMapTheWordsCountFromZero) {
+TEST_F(TValueWordsTest, WithoutValueMapTheWordsCountFromZero) {
   fNamespace->DefineClass("X_A")
       .Property("P", "uint8")
       .Qualifier("Values", TCIMValue(TType::kCIMTypeString, 0, {TCIMValue("zero"), TCIMValue("one")}));
   EXPECT_EQ(WordsOf("X_A").WordFor(TCIMValue(static_cast<unsigned char>(1))), "one");
 }
 
-TEST_F(ValueWordsTest, MoreValuesThanWordsOrTheOtherWayRound) {
+TEST_F(TValueWordsTest, MoreValuesThanWordsOrTheOtherWayRound) {
   EXPECT_EQ(Words({"0", "1"}, {"zero"}).Entries().size(), 1u);
   EXPECT_EQ(Words({"0"}, {"zero", "one"}).Entries().size(), 1u);
 }
 
-TEST_F(ValueWordsTest, APropertyThatIsOverriddenLendsItsWords) {
+TEST_F(TValueWordsTest, APropertyThatIsOverriddenLendsItsWords) {
   fNamespace->DefineClass("X_Top").Property("P", "uint16").ValueMap({"5"}, {"OK"});
   fNamespace->DefineClass("X_Middle", "X_Top");
   fNamespace->DefineClass("X_Bottom", "X_Middle").Property("P", "uint16").Override();
@@ -96,11 +96,11 @@ TEST_F(ValueWordsTest, APropertyThatIsOverriddenLendsItsWords) {
   EXPECT_EQ(WordsOf("X_Own").TextOf(Uint16(5)), "5 (Fine)");
 }
 
-TEST_F(ValueWordsTest, APropertyThatIsNotEnumeratedHasNoWords) {
+TEST_F(TValueWordsTest, APropertyThatIsNotEnumeratedHasNoWords) {
   fNamespace->DefineClass("X_A").Property("P", "uint16");
   EXPECT_TRUE(WordsOf("X_A").Entries().empty());
   EXPECT_EQ(WordsOf("X_A").TextOf(Uint16(5)), "5");
 }
 
 }  // namespace
-}  // namespace NQRVZEP20::zep
+}  // namespace NQRVZEP20

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "collect/ValueWords.h"
+#include "collect/TValueWords.h"
 
 #include "ICIMClass.h"
 #include "ICIMPropertyDecl.h"
@@ -10,7 +10,7 @@
 #include <optional>
 #include <string_view>
 
-namespace NQRVZEP20::zep {
+namespace NQRVZEP20 {
 
 namespace {
 
@@ -101,4 +101,4 @@ std::string TValueWords::TextOf(TCIMValue const& value) const {
   return word.empty() ? value.ToString() : value.ToString() + " (" + word + ")";
 }
 
-}  // namespace NQRVZEP20::zep
+}  // namespace NQRVZEP20

@@ -1,0 +1,27 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/FailureOf.h"
+
+#include "TZEPException.h"
+
+#include <gtest/gtest.h>
+
+#include <stdexcept>
+
+namespace NQRVZEP20 {
+namespace {
+
+TEST(FailureOfTest, IsEmptyAfterSuccess) {
+  EXPECT_EQ(FailureOf([] {}), "");
+}
+
+TEST(FailureOfTest, NamesWhatWasThrown) {
+  EXPECT_EQ(FailureOf([] { throw std::runtime_error("the disk is full"); }), "the disk is full");
+  EXPECT_EQ(FailureOf([] { throw TZEPException(kZEPStatusAccessDenied); }), "kZEPStatusAccessDenied");
+}
+
+TEST(FailureOfTest, HoldsBackObjectsThatAreNotExceptions) {
+  EXPECT_EQ(FailureOf([] { throw 5; }), "it threw something that is not a std::exception");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

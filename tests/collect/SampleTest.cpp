@@ -1,0 +1,36 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/Sample.h"
+
+#include "tests/Support.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+
+namespace NQRVZEP20 {
+namespace {
+
+TEST(SampleTest, ProvidersFindTheSampleInTheEnvironment) {
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", "/callers/table"), name("ZEP_HOST_NAME", "db1");
+  EXPECT_EQ(NamedTableFile(), "/callers/table");
+  SetForProviders({"/samples/table", "sample-server", "SAMPLE"});
+  EXPECT_EQ(NamedTableFile(), "/samples/table");
+  EXPECT_STREQ(std::getenv("ZEP_HOST_NAME"), "sample-server");
+}
+
+TEST(SampleTest, SourcesAreLabelledOnlyWithASample) {
+  struct TRow {
+    char const *source, *labelled;
+  } const rows[] = {
+      {"ZEP_HOST_NAME", "SAMPLE"},
+      {"SMBIOS type 1 (file)", "SAMPLE, SMBIOS type 1"},
+      {"/etc/os-release", "/etc/os-release (not of the sample)"},
+  };
+  for (TRow const& row : rows) {
+    EXPECT_EQ(LabelledSource(row.source, "SAMPLE"), row.labelled);
+    EXPECT_EQ(LabelledSource(row.source, ""), row.source);
+  }
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

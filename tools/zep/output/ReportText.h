@@ -1,0 +1,13 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "collect/Report.h"
+
+#include <string>
+
+namespace NQRVZEP20::zep {
+
+// The report for people: the head lines, then tables of the identity, the details and the plug-ins.
+std::string ReportAsText(TReport const& report);
+
+}  // namespace NQRVZEP20::zep
