@@ -54,7 +54,7 @@ TEST_F(TValueWordsTest, RangesHaveAWordToo) {
     EXPECT_EQ(words.WordFor(Uint16(row.value)), row.word) << row.value;
 }
 
-TEST_F(TValueWordsTest, NumbersAreComparedAsNumbersToTheirLastDigit) {
+TEST_F(TValueWordsTest, NumbersAreComparedExactly) {
   TValueWords const words =
       Words({"-5..-1", "0x10", "18446744073709551615", "9007199254740993.."}, {"below", "sixteen", "most", "large"}, "uint64");
   EXPECT_EQ(words.WordFor(TCIMValue(-3)), "below");
@@ -64,7 +64,7 @@ TEST_F(TValueWordsTest, NumbersAreComparedAsNumbersToTheirLastDigit) {
   EXPECT_EQ(words.WordFor(TCIMValue(9007199254740992ul)), "");
 }
 
-TEST_F(TValueWordsTest, EntriesThatMakeNoSenseAreNoEntries) {
+TEST_F(TValueWordsTest, InvalidEntriesAreIgnored) {
   TValueWords const words = Words({"", "x", "1..x", "..x", "5.", "99999999999999999999"}, {"a", "b", "c", "d", "e", "f"});
   for (int const value : {0, 1, 2, 5, 9}) EXPECT_EQ(words.WordFor(Uint16(value)), "") << value;
 }
@@ -82,12 +82,12 @@ TEST_F(TValueWordsTest, WithoutValueMapTheWordsCountFromZero) {
   EXPECT_EQ(WordsOf("X_A").WordFor(TCIMValue(static_cast<unsigned char>(1))), "one");
 }
 
-TEST_F(TValueWordsTest, MoreValuesThanWordsOrTheOtherWayRound) {
+TEST_F(TValueWordsTest, SurplusValuesAndWordsAreIgnored) {
   EXPECT_EQ(Words({"0", "1"}, {"zero"}).Entries().size(), 1u);
   EXPECT_EQ(Words({"0"}, {"zero", "one"}).Entries().size(), 1u);
 }
 
-TEST_F(TValueWordsTest, APropertyThatIsOverriddenLendsItsWords) {
+TEST_F(TValueWordsTest, AnOverridingPropertyInheritsWords) {
   fNamespace->DefineClass("X_Top").Property("P", "uint16").ValueMap({"5"}, {"OK"});
   fNamespace->DefineClass("X_Middle", "X_Top");
   fNamespace->DefineClass("X_Bottom", "X_Middle").Property("P", "uint16").Override();

@@ -30,28 +30,28 @@ namespace {
 constexpr char const* kIsEmpty = " is given but empty";
 
 constexpr TCommand kCommands[] = {
-    {"report", "Tell which machine this is", AddReportArguments},
+    {"report", "Report which machine this is", AddReportArguments},
     {"show", "Print one object or class of the providers' namespaces, or of a MOF file", AddShowArguments},
     {"classes", "List the classes of the providers' namespaces, or of a MOF file", AddClassesArguments},
     {"mof", "Load and check a schema in MOF", AddMofArguments},
     {"media", "List, mount and unmount removable media", AddMediaArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},
-    {"remote", "Tell which machines are behind management controllers", AddRemoteArguments},
+    {"remote", "Identify servers through their management controllers", AddRemoteArguments},
     {"run", "Run a command as the library runs one, and print its output", AddRunArguments},
     {"send", "Send a file to an FTP or SFTP server", AddSendArguments},
     {"get", "Fetch a file from an FTP or SFTP server", AddGetArguments},
-    {"proxy-check", "Tell whether a web proxy lets requests through", AddProxyCheckArguments},
+    {"proxy-check", "Check whether a web proxy lets requests through", AddProxyCheckArguments},
     {"wpad", "Find the proxy configuration file that the DHCP server names", AddWpadArguments},
-    {"help", "Tell how zep, or one of its commands, is called", AddHelpArguments},
+    {"help", "List the commands, or describe one", AddHelpArguments},
 };
 
-// The option's own name: of "--name=value" and "-nvalue" without the value.
+// The name of the option, without the value of "--name=value" or "-nvalue".
 std::string NameOfOption(std::string const& word) {
   return word.rfind("--", 0) == 0 ? word.substr(0, word.find('=')) : word.substr(0, 2);
 }
 
-// How many of the words zep reads as options and the like. What stands behind "--" is none, and of "zep run [OPTIONS] COMMAND"
-// neither is the command.
+// The number of leading words that zep itself reads: those before "--", and of "zep run [OPTIONS] COMMAND" those before the
+// command.
 std::size_t WordsOfZep(std::vector<std::string> const& words) {
   bool const isRun = !words.empty() && words.front() == "run";
   std::size_t at = isRun ? 1 : 0;
@@ -60,8 +60,8 @@ std::size_t WordsOfZep(std::vector<std::string> const& words) {
   return at;
 }
 
-// The arguments, the last one first, as CLI11 takes them. It would take "--send=" for one whose value is the next word, and
-// what stands behind the "--" of "zep run" for options; and it would obey "--json=false".
+// The arguments in reverse order, as CLI11 expects them. CLI11 would read the next word as the value of "--send=", would read the
+// words after the "--" of "zep run" as options, and would accept "--json=false".
 std::vector<std::string> ArgumentsOf(std::vector<std::string> words) {
   std::size_t const end = WordsOfZep(words);
   for (std::size_t at = 0; at < end; ++at) {
@@ -90,7 +90,7 @@ void CheckForEmpty(CLI::App const& app) {
   for (CLI::App const* const chosen : app.get_subcommands()) CheckForEmpty(*chosen);
 }
 
-// The words that nothing takes.
+// The words that are neither options nor arguments of the command.
 std::vector<std::string> ExtrasOf(CLI::App const& app) {
   std::vector<std::string> words = app.remaining(true);
   if (app.got_subcommand("run")) words.erase(std::find(words.begin(), words.end(), kCommandFollows), words.end());
@@ -104,7 +104,7 @@ bool HasOnlyLetters(std::string const& word) {
   return std::all_of(word.begin(), word.end(), [](unsigned char c) { return std::isalpha(c) != 0; });
 }
 
-// A word that zep does not know may be a password, and is not said.
+// An unknown word may be a password, so only names of options and words of letters are repeated.
 void CheckForExtras(CLI::App const& app) {
   std::vector<std::string> const words = ExtrasOf(app);
   if (words.empty()) return;
@@ -117,7 +117,7 @@ void CheckForExtras(CLI::App const& app) {
                                       : "there are " + std::to_string(words.size()) + " arguments too many");
 }
 
-// CLI11 says these three when an option does not take its value, with the value.
+// The three messages of CLI11 for a value that an option does not accept; they contain the value.
 bool IsAbout(std::string const& message, std::string const& option) {
   std::string const end = " is not an allowed value for " + option;
   return message.rfind(option + ": ", 0) == 0 || message.rfind("Could not convert: " + option + " = ", 0) == 0 ||
@@ -133,7 +133,7 @@ std::string WhyNoValue(CLI::App const& chosen, std::string const& message) {
   return "an option does not take its value";
 }
 
-// What CLI11 says is the name of the option, or the command, with words of its own, but for values.
+// Messages of CLI11 about values repeat the value, which may be a password; the others name the option or the command.
 std::string WhyRefused(CLI::App const& app, CLI::ParseError const& refusal) {
   CLI::App const& chosen = ChosenOf(app);
   std::string const message = refusal.what();
@@ -143,7 +143,7 @@ std::string WhyRefused(CLI::App const& app, CLI::ParseError const& refusal) {
   return isOfValue ? WhyNoValue(chosen, message) : message;
 }
 
-// Help and version are written like any other output.
+// Writes help and version like any other output.
 int Answer(CLI::App const& app, CLI::Success const& question) {
   std::ostringstream answer;
   app.exit(question, answer, answer);
@@ -157,7 +157,7 @@ TRuns AddCommands(CLI::App& app) {
   TRuns runs;
   app.set_version_flag("--version", "zep " ZEP_VERSION " (build " ZEP_BUILD_ID ")");
   app.require_subcommand(1);
-  app.footer("zep COMMAND --help tells more of a command.");
+  app.footer("zep COMMAND --help describes a command.");
   for (TCommand const& command : kCommands) {
     CLI::App* const added = app.add_subcommand(command.fName, command.fDescription);
     runs[added] = command.fAddArguments(*added);
@@ -180,12 +180,12 @@ int Run(CLI::App& app, TRuns const& runs, std::vector<std::string> const& words)
   return runs.at(app.get_subcommands().front())();
 }
 
-// "zep remote" uses it; what "zep run" runs may print it, from elsewhere.
+// "zep remote" uses the password; a command of "zep run" may print it, having read it elsewhere.
 bool IsControllersPasswordNeeded(std::vector<std::string> const& words) {
   return std::any_of(words.begin(), words.end(), [](std::string const& word) { return word == "remote" || word == "run"; });
 }
 
-// Before anything else, and anything that might be printed.
+// Called first, before anything is printed.
 void KeepSecrets(std::vector<std::string> const& words) {
   TakePasswordOutOfTheEnvironment(IsControllersPasswordNeeded(words));
   static TGuardedErrors const errors;  // to the end of the program
@@ -194,13 +194,13 @@ void KeepSecrets(std::vector<std::string> const& words) {
 
 // ---- Failures ----
 
-// Read from the words: CLI11 may have stopped before the option.
+// Reads the words, because CLI11 may have stopped before the option.
 bool IsJsonWanted(std::vector<std::string> const& words) {
   auto const end = words.begin() + static_cast<std::ptrdiff_t>(WordsOfZep(words));
   return std::any_of(words.begin(), end, [](std::string const& word) { return word == "--json"; });
 }
 
-// "zep media mount", from the words too; "zep" when the first one is not a command.
+// "zep media mount"; "zep" when the first word is not a command. Also from the words.
 std::string NameOfDocument(CLI::App const& app, std::vector<std::string> const& words) {
   std::string name = app.get_name();
   CLI::App const* command = words.empty() ? nullptr : CommandNamed(app, words.front());
@@ -213,16 +213,16 @@ std::string NameOfDocument(CLI::App const& app, std::vector<std::string> const& 
   return name;
 }
 
-// A document that is printed already, in part perhaps, stays the only one.
+// Prints no second document when one was printed, even in part.
 void WriteFailure(std::string const& document, std::exception const& failure) {
   if (HasWrittenOutput()) return;
   std::string const why = FailureOf([&] { WriteOutput(FailureAsJson(document, StatusOf(failure), failure.what())); });
   if (!why.empty()) std::cerr << "zep: " << Printable(why) << '\n';
 }
 
-// A caller that ignores SIGCHLD, as some services do, passes that on, and the result of no child could be had. One that blocks
-// the signals that end a program passes that on too, and nothing but SIGKILL would end zep. SIGPIPE stays as the caller has it
-// (Output.h).
+// Signal settings are inherited. From a caller that ignores SIGCHLD, as some services do, zep could not get the exit status of
+// its children; from one that blocks the signals that end a program, only SIGKILL would end zep. SIGPIPE remains as the caller
+// set it (Output.h).
 void SetSignals() {
   ::signal(SIGCHLD, SIG_DFL);
   sigset_t signals;
@@ -232,7 +232,8 @@ void SetSignals() {
 }
 
 int RunOrFail(std::vector<std::string> const& words) {
-  CLI::App app("zep tells what a server knows of itself, through the provider plug-ins beside libzepcore.so.", "zep");
+  CLI::App app("zep reports what a server knows about itself, through the provider plug-ins in the directory of libzepcore.so.",
+               "zep");
   TRuns const runs = AddCommands(app);
   try {
     return Run(app, runs, words);

@@ -1145,7 +1145,7 @@ TEST_F(ZepTransferTest, OnATerminalItAsksBeforeItOverwrites) {
   std::string const file = Local("f", "old"), question = file + " exists; overwrite it? (y/n): ";
   TTerminalRun run = ZepOnTerminal({"get", Url("f"), file}, {{question, "n\n"}});
   EXPECT_EQ(run.exitCode, kNotWritten);
-  EXPECT_THAT(run.shown, HasSubstr(file + " is left as it is"));
+  EXPECT_THAT(run.shown, HasSubstr(file + " was not overwritten"));
   EXPECT_EQ(ReadFile(file), "old");
   run = ZepOnTerminal({"get", "--no-clobber", Url("f"), file}, {});
   EXPECT_EQ(run.exitCode, kNotWritten);
@@ -1253,7 +1253,7 @@ TEST(ZepProxyCheckTest, PassesOnlyWhenThePageComesBack) {
 
   run = Zep("proxy-check zep:topsecret@" + shown);
   EXPECT_EQ(run.exitCode, kNothing);
-  EXPECT_THAT(run.output, AllOf(HasSubstr("the page did not come through; the title of the page that arrived is: 40"),
+  EXPECT_THAT(run.output, AllOf(HasSubstr("the expected page was not returned; the title of the returned page is: 40"),
                                 Not(HasSubstr("topsecret"))));
   proxy.reset();
   run = Zep("proxy-check zep:secret@" + shown);
@@ -1278,7 +1278,7 @@ TEST(ZepProxyCheckTest, PassesOnlyWhenThePageComesBack) {
   // A page that repeats what the proxy was told.
   WriteFile(dir.Path("other"), "<title>no topsecret, dXNlcjp0b3BzZWNyZXQ= or http://user:topsecret@h</title>");
   run = Zep("proxy-check user:topsecret@127.0.0.1:" + proxy->Port());
-  EXPECT_THAT(run.output, EndsWith("the title of the page that arrived is: no ***, *** or http://user:***@h\n"));
+  EXPECT_THAT(run.output, EndsWith("the title of the returned page is: no ***, *** or http://user:***@h\n"));
 
   for (char const* wrong : {"127.0.0.1", "ftp://127.0.0.1:1", "127.0.0.1:1/path", "127.0.0.1:http"})
     EXPECT_EQ(Zep(std::string("proxy-check ") + wrong).exitCode, kUsage) << wrong;

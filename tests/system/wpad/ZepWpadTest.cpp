@@ -90,7 +90,7 @@ TEST_F(ZepWpadTest, SaysThatDhcpClientsWillBeEndedAndAsks) {
     ASSERT_GE(errors.size(), 3u);
     EXPECT_EQ(errors[0] + "\n", kWillEnd);
     EXPECT_NE(errors[1].find(" dhclient"), std::string::npos) << errors[1];
-    std::string const asked = "Go on? [y/N] ";
+    std::string const asked = "Continue? [y/N] ";
     EXPECT_EQ(errors[2].substr(0, asked.size()), asked);
     std::string const refused = "zep: nothing was done; --yes confirms, and --no-stop leaves the DHCP clients alone";
     EXPECT_EQ(errors[2].substr(asked.size()) == refused, !row.isEnded) << errors[2];
@@ -102,7 +102,7 @@ TEST_F(ZepWpadTest, UnconfirmedIsNothing) { EXPECT_EQ(Zep("", "echo n | $ZEP wpa
 TEST_F(ZepWpadTest, YesIsSaidOnTheCommandLine) {
   TRun const run = Zep("WPAD_DHCLIENT=1", kOnceItRuns + "$ZEP wpad --yes" + kIsItThere);
   EXPECT_EQ(LinesOf(run.output).back(), "0");
-  EXPECT_EQ(run.errors.find("Go on?"), std::string::npos) << run.errors;
+  EXPECT_EQ(run.errors.find("Continue?"), std::string::npos) << run.errors;
 }
 
 // A name with a line break in it is two lines for BusyBox.
@@ -155,7 +155,7 @@ TEST_F(ZepWpadTest, NoAnswer) {
   TRun const run = Zep("WPAD_SERVER=none", kInHurry + "$ZEP wpad --no-stop");
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, kTable + "eth0              10.77.0.2         3 x 1472 bytes  nothing within 18 s\n");
-  EXPECT_EQ(run.errors, "zep: nobody named a proxy configuration file\n");
+  EXPECT_EQ(run.errors, "zep: no server returned a proxy configuration URL\n");
 }
 
 TEST_F(ZepWpadTest, AnAnswerWithoutAUrl) {
@@ -192,7 +192,7 @@ TEST_F(ZepWpadTest, SaysOfEachInterfaceWhatBecameOfIt) {
       {"WPAD_ROUTE=none", "",
        "eth0              10.77.0.2         nothing         sending failed: Network is\n"
        "                                                    unreachable\n",
-       "zep: nobody named a proxy configuration file\n"},
+       "zep: no server returned a proxy configuration URL\n"},
       {"WPAD_FIRST=up WPAD_NAME=net1",
        "mkdir /dev/shm/bin; printf '#!/bin/sh\\necho inet6 addr: fd77::2/64' > /dev/shm/bin/ifconfig; "
        "chmod +x /dev/shm/bin/ifconfig; export PATH=/dev/shm/bin:$PATH; ",

@@ -35,7 +35,7 @@ struct TNamespaceClasses {
   std::vector<TClassEntry> fClasses;
 };
 
-// "abstract association", or nothing.
+// Such as "abstract association"; empty for a plain class.
 std::string KindOf(TClassEntry const& entry) {
   std::string kind;
   auto const add = [&kind](bool is, char const* word) {
@@ -86,7 +86,7 @@ struct TClasses {
   }
   EExitStatus ExitStatus() const { return IsEmpty() ? kExitNothing : fFailures.empty() ? kExitComplete : kExitPartial; }
 
-  // Why not everything is shown, a reason each.
+  // Why classes are missing.
   std::vector<std::string> Reasons() const {
     std::vector<std::string> reasons = fFailures;
     if (IsEmpty()) reasons.push_back("there is no class");
@@ -139,12 +139,12 @@ int Classes(TArguments const& arguments) {
 TRun AddClassesArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command.add_flag("--tree", arguments->fAsTree, "Show each class indented below its superclass");
-  auto* const mof = command.add_option("--mof", arguments->fMofFile, "Show the classes of this MOF file, not the providers'");
+  auto* const mof =
+      command.add_option("--mof", arguments->fMofFile, "List the classes of this MOF file instead of the providers'");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
-  command.add_flag("--sample", arguments->fSample, "Let the host provider describe the bundled sample, labelled SAMPLE")
-      ->excludes(mof);
+  command.add_flag("--sample", arguments->fSample, "List the classes for the bundled sample, labelled SAMPLE")->excludes(mof);
   command.footer(
-      "Exit status: 0 when there are classes, 2 when there are but a plug-in failed, 1 when there are none,\n"
+      "Exit status: 0 when there are classes, 2 when there are classes but a plug-in failed, 1 when there are none,\n"
       "64 for wrong usage.");
   return [arguments] { return Classes(*arguments); };
 }

@@ -10,20 +10,22 @@ class App;
 
 namespace NQRVZEP20::zep {
 
-// What a command does once its arguments are read; returns an EExitStatus.
+// Runs a command whose arguments are parsed; returns an EExitStatus.
 using TRun = std::function<int()>;
 
-// Each adds its command to the program, with its arguments. One file for each; main.cpp has the table of them.
+// A subcommand. `fAddArguments` adds its arguments to `command` and returns the function that runs it. Each has a file of its
+// own; main.cpp has the table.
 struct TCommand {
   char const* fName;
   char const* fDescription;
   TRun (*fAddArguments)(CLI::App& command);
 };
 
-// Stands in front of the words that "zep run" runs, which are the rest of the remaining ones, whatever they look like.
+// Separates, among the remaining words of CLI11, the command line that "zep run" runs: everything after it, whatever it looks
+// like.
 constexpr char const* kCommandFollows = "command:";
 
-// The command of "zep media" that is done without a word; its document is that of "zep media".
+// The default command of "zep media"; its document is that of "zep media".
 constexpr char const* kListMedia = "list";
 
 TRun AddClassesArguments(CLI::App& command);     // ClassesCommand.cpp
@@ -40,7 +42,7 @@ TRun AddSendArguments(CLI::App& command);        // SendCommand.cpp
 TRun AddShowArguments(CLI::App& command);        // ShowCommand.cpp
 TRun AddWpadArguments(CLI::App& command);        // WpadCommand.cpp
 
-// The command of that name below this one, or null (HelpCommand.cpp).
+// The subcommand of that name, or null; it belongs to `app` (HelpCommand.cpp).
 CLI::App const* CommandNamed(CLI::App const& app, std::string const& name);
 
 }  // namespace NQRVZEP20::zep

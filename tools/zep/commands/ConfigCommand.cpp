@@ -32,7 +32,7 @@ struct TArguments {
 
 struct TSetting {
   std::string fKey, fValue;
-  std::size_t fLine;  // 0 when the file has changed meanwhile
+  std::size_t fLine;  // 0 when the file changed between the two readings
 };
 
 struct TIgnoredLine {
@@ -47,22 +47,22 @@ struct TSettings {
   bool fIsCut;  // a reading error came before the end
 };
 
-// Why the library passes a line over; empty when it does not. `lineOfKey` has the keys of the lines before.
+// Why the library ignores a line; empty when it does not. `lineOfKey` has the keys of the lines before it.
 std::string ReasonToIgnore(std::string const& text, std::map<std::string, std::size_t> const& lineOfKey) {
   std::size_t const equals = text.find('=');
   if (text.empty()) return "an empty line";
   if (text.front() == '#') return "a comment";
   if (equals == 0) return "no key before \"=\"";
-  if (equals == text.size() - 1) return "no value behind \"=\"";
+  if (equals == text.size() - 1) return "no value after \"=\"";
   auto const first = lineOfKey.find(text.substr(0, equals));
   if (first != lineOfKey.end()) return "line " + std::to_string(first->second) + " sets the key, and the first counts";
   return "";
 }
 
-// The library opens no other, so that a pipe of that name holds nobody up.
+// The library opens no other file, so a pipe of that name does not block.
 bool IsReadByTheLibrary() { return TOSSpecific::FileExists(kFileName) && TOSSpecific::GetFileSize(kFileName) != 0; }
 
-// Values are the library's own; the file is read a second time for what it does not tell: the lines.
+// The values come from the library; the file is read a second time for the line numbers, which the library does not report.
 TSettings ReadSettings() {
   TSettings settings{TOSSpecific::GetCurrentDir() + "/" + kFileName, {}, {}, false};
   std::map<std::string, std::size_t> lineOfKey;
@@ -91,7 +91,7 @@ void KeepOnly(std::string const& key, TSettings& settings) {
   ignored.erase(std::remove_if(ignored.begin(), ignored.end(), isOther), ignored.end());
 }
 
-// Blanks at either end belong to the text, so they are made visible.
+// Blanks at either end belong to the text, so quotes show them.
 std::string WithVisibleEnds(std::string const& text) {
   bool const hasBlank = !text.empty() && (text.front() == ' ' || text.back() == ' ');
   return hasBlank ? "\"" + text + "\"" : text;
@@ -130,7 +130,7 @@ std::string AsJson(TSettings const& settings, EExitStatus status, std::string co
   return zep::AsText(document);
 }
 
-// Why there is no setting at all, or none of that key; empty when there is one.
+// Why there is no setting, or none of that key; empty when there is one.
 std::string WhyNothing(TArguments const& arguments, TSettings const& settings) {
   if (!settings.fSettings.empty()) return "";
   if (!TOSSpecific::FileExists(kFileName)) return "there is no " + settings.fPath;

@@ -28,7 +28,7 @@ struct TArguments {
 
 namespace fs = std::filesystem;
 
-// Of a symbolic link what it leads to: that is written, and the link stays.
+// The target of a symbolic link: the target is written, and the link remains.
 std::string WithoutLinks(std::string const& file) {
   std::error_code nowhere;
   if (!fs::is_symlink(fs::symlink_status(file, nowhere))) return file;
@@ -43,15 +43,15 @@ bool IsOverwritingWanted(std::string const& file) {
   return answer == "y" || answer == "Y";
 }
 
-// Why the file may not be written; empty when it may. Asks only where somebody can answer. A device and the like is never
-// replaced, nor a link that leads nowhere.
+// Why the file may not be written; empty when it may. Prompts only when standard input is a terminal. A device, a broken link
+// and the like are never replaced.
 std::string WhyNotWritten(TArguments const& arguments, std::string const& file, fs::file_status const& status) {
   if (!fs::exists(status)) return "";
   if (fs::is_directory(status)) return Printable(file) + " is a directory";
   if (!fs::is_regular_file(status)) return Printable(file) + " is not a regular file";
   if (arguments.fForce) return "";
   if (!arguments.fNoClobber && ::isatty(STDIN_FILENO))
-    return IsOverwritingWanted(file) ? "" : Printable(file) + " is left as it is";
+    return IsOverwritingWanted(file) ? "" : Printable(file) + " was not overwritten";
   return Printable(file) + " exists" + (arguments.fNoClobber ? "" : "; --force overwrites it");
 }
 
@@ -66,7 +66,7 @@ int Refuse(TRemote const& source, std::string const& file, std::string const& wh
 }
 
 int Get(TArguments const& arguments) {
-  if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the URL comes first, and the file behind it");
+  if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the URL comes first, the file second");
   TTarget const source = TargetOf(arguments.fUrl, false);
   if (source.fIsHost) throw TWrongUsage("a URL is needed, ftp:// or sftp://");
   std::string const file = WithoutLinks(arguments.fFile);
@@ -87,16 +87,17 @@ TRun AddGetArguments(CLI::App& command) {
   command.add_option("url", arguments->fUrl, "ftp://[USER@]HOST[:PORT]/PATH or sftp://...")->required();
   command.add_option("file", arguments->fFile, "The file to write")->required();
   CLI::Option* const force = command.add_flag("--force", arguments->fForce, "Overwrite the file without asking");
-  command.add_flag("--no-clobber", arguments->fNoClobber, "Leave a file that is there as it is, without asking")->excludes(force);
+  command.add_flag("--no-clobber", arguments->fNoClobber, "Never overwrite an existing file, without asking")->excludes(force);
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddSizeOption(command, "--max-size", arguments->fOptions.fMostBytes,
                 "The most bytes that are fetched (10 GiB), such as 500K, 2M or 1G; 0: no limit");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
-      "A file that is there is overwritten after a question, which is asked on a terminal only; of a symbolic link the file\n"
-      "that it leads to. Until all has arrived the file has \".part\" after its name. A broken transfer leaves that file and a\n"
-      "note of its URL and size, \".part.from\". The next transfer continues the file when the server can start in the middle\n"
-      "and reports (FTP: by MDTM) the same time and size at the same URL; otherwise all of it is fetched again.\n" +
+      "An existing file is overwritten only after a question, which is asked on a terminal only. A symbolic link remains, and\n"
+      "its target is overwritten. Until the download is complete, the file name ends in \".part\". A failed transfer leaves "
+      "that\n"
+      "file and a note of its URL and size, \".part.from\". The next transfer continues the file when the server can start in\n"
+      "the middle and reports (FTP: by MDTM) the same time and size at the same URL; otherwise it fetches the file again.\n" +
       TransferHelp());
   return [arguments] { return Get(*arguments); };
 }

@@ -60,15 +60,15 @@ std::string AsJson(std::vector<TMedium> const& media, EExitStatus status, std::s
   return zep::AsText(document);
 }
 
-// Why the list is empty or lacks something; empty when it does not.
-std::string WhatIsMissing(std::vector<TMedium> const& media) {
+// Why the list is empty or incomplete; empty when it is complete.
+std::string WhyIncomplete(std::vector<TMedium> const& media) {
   if (media.empty()) return "there is no removable medium";
   return AreLabelsReadable() ? "" : "labels and file systems can be read by root only";
 }
 
 int List(bool asJson) {
   std::vector<TMedium> const media = FindMedia();
-  std::string const missing = WhatIsMissing(media);
+  std::string const missing = WhyIncomplete(media);
   EExitStatus const status = media.empty() ? kExitNothing : missing.empty() ? kExitComplete : kExitPartial;
   if (!media.empty() || asJson) WriteOutput(asJson ? AsJson(media, status, missing) : AsText(media));
   if (!missing.empty()) std::cerr << "zep: " << missing << "\n";
@@ -107,21 +107,20 @@ int Media(TArguments const& arguments) {
 
 TRun AddMediaArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
-  CLI::App* const list = command.add_subcommand(kListMedia, "List them, which is also done without a word");
-  CLI::App* const mount = command.add_subcommand("mount", "Mount one at /mnt/key, a floppy at /mnt/floppy");
-  CLI::App* const unmount = command.add_subcommand("umount", "Unmount one, so that it can be taken out");
-  mount->add_option("device", arguments->fDevice, "The device, such as /dev/sdb; its first partition is tried as well")
-      ->required();
+  CLI::App* const list = command.add_subcommand(kListMedia, "List removable media; the default");
+  CLI::App* const mount = command.add_subcommand("mount", "Mount a medium at /mnt/key, a floppy at /mnt/floppy");
+  CLI::App* const unmount = command.add_subcommand("umount", "Unmount a medium, so that it can be taken out");
+  mount->add_option("device", arguments->fDevice, "The device, such as /dev/sdb; its first partition is tried, too")->required();
   unmount->add_option("directory", arguments->fDirectory, "Where it is mounted")->required();
   for (CLI::App* const each : {&command, list, mount, unmount})
     each->add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.require_subcommand(0, 1);
   command.footer(
-      "Listed are USB disks, floppies and CD-ROMs with a medium, as lsblk shows them. Mounting needs root.\n"
-      "Exit status: 0 when it was done, 2 when labels are missing from the list or when the drive of what was\n"
-      "unmounted is mounted elsewhere too, 1 when there is no medium or it could not be done, 64 for wrong usage,\n"
-      "which a name with other characters than letters, digits, \"/\", \"-\", \"_\" and \".\" is, or a device that is\n"
-      "not below /dev, or a directory that is not below /mnt, /media or /run/media.");
+      "The list contains USB disks, floppies and CD-ROMs with a medium, as lsblk shows them. Mounting needs root.\n"
+      "Device names are below /dev, directories below /mnt, /media or /run/media; both consist of letters, digits, \"/\",\n"
+      "\"-\", \"_\" and \".\".\n"
+      "Exit status: 0 when everything was done, 2 when labels are missing from the list or when the unmounted medium is\n"
+      "still mounted elsewhere, 1 when there is no medium or the command failed, 64 for wrong usage.");
   return [arguments] { return Media(*arguments); };
 }
 

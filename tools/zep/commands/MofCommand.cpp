@@ -36,8 +36,8 @@ struct TCount {
   std::size_t fCount = 0;
 };
 
-// How much of each kind of thing a namespace has. Of the classes nothing is kept but the names of the indications: a schema
-// may have very many.
+// Counts the declarations of each kind in a namespace. Of the classes it keeps only the names of the indications, because a
+// schema may have very many classes.
 class TCensus {
 public:
   explicit TCensus(ICIMNamespace const& ns) {
@@ -73,7 +73,7 @@ private:
         TCIMContext());
   }
 
-  // Its superclass, if any, was asked before.
+  // Its superclass, if any, was counted before.
   bool IsIndication(ICIMClass const& cls) {
     auto const superClass = cls.GetSuperClass(TCIMContext());
     bool const isBelowOne = superClass && fIndicationNames.count(superClass->GetName(TCIMContext())) != 0;
@@ -123,10 +123,10 @@ int Mof(TArguments const& arguments) {
 
 TRun AddMofArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
-  command.add_option("file", arguments->fFile, "The MOF file; what it includes lies in its folder or below")->required();
-  auto* const print = command.add_flag("--print", arguments->fPrint, "Write everything that was read as one MOF text");
+  command.add_option("file", arguments->fFile, "The MOF file; the files that it includes are in its folder or below")->required();
+  auto* const print = command.add_flag("--print", arguments->fPrint, "Print everything that was read as one MOF text");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document")->excludes(print);
-  command.footer("Exit status: 0 when the schema is right, 1 when it is not, 64 for wrong usage.");
+  command.footer("Exit status: 0 when the schema is correct, 1 when it is not, 64 for wrong usage.");
   return [arguments] { return Mof(*arguments); };
 }
 

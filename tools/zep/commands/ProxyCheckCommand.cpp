@@ -31,30 +31,30 @@ struct TArguments {
   TTransferOptions fOptions;
 };
 
-// Passwords are hidden before the text is cut, which might cut one.
+// Hides passwords before it cuts the text, because the cut might split one.
 std::string FirstLineOf(std::string const& whole) {
   constexpr std::size_t kLongest = 200;
   std::string const text = WithoutSecrets(whole);
   return Printable(text.substr(0, std::min(kLongest, text.find_first_of("\r\n"))));
 }
 
-// The title of a web page, such as that of a proxy's refusal; else its first line.
+// The title of a web page, such as a proxy's refusal; otherwise its first line.
 std::string AnswerIn(std::string const& page) {
-  if (page.empty()) return "nothing came back";
+  if (page.empty()) return "the returned page is empty";
   std::string const start = "<title>";
   std::size_t const title = page.find(start), end = page.find("</title>");
-  if (title == page.npos || end == page.npos || end < title) return "what came back begins with: " + FirstLineOf(page);
-  return "the title of the page that arrived is: " + FirstLineOf(page.substr(title + start.size(), end - title - start.size()));
+  if (title == page.npos || end == page.npos || end < title) return "the returned text begins with: " + FirstLineOf(page);
+  return "the title of the returned page is: " + FirstLineOf(page.substr(title + start.size(), end - title - start.size()));
 }
 
-// A file of any size, of which no more than a piece is in memory at a time.
+// Reads the file in pieces, because it may be large.
 bool HoldsText(std::string const& file, std::string const& text) {
   std::ifstream stream(file, std::ios::binary);
   std::string piece, chunk(65536, '\0');
   while (stream.read(chunk.data(), static_cast<std::streamsize>(chunk.size())), stream.gcount() > 0) {
     piece.append(chunk, 0, static_cast<std::size_t>(stream.gcount()));
     if (piece.find(text) != piece.npos) return true;
-    piece.erase(0, piece.size() - std::min(piece.size(), text.size() - 1));  // the end may be a beginning of it
+    piece.erase(0, piece.size() - std::min(piece.size(), text.size() - 1));  // the end may be the beginning of the text
   }
   return false;
 }
@@ -72,7 +72,7 @@ bool IsCutAt(std::string const& file, std::uint64_t mostBytes) {
   return mostBytes > 0 && std::filesystem::file_size(file, absent) >= mostBytes && !absent;
 }
 
-// The library gives libcurl's words, which name no remedy.
+// Replaces libcurl's message, which the library passes on and which names no remedy.
 void ExplainNoConnection(TOutcome& outcome, TRemote const& proxy) {
   constexpr int kProbeSeconds = 3;
   std::string const why = WhyUnreachable(proxy.fHost, proxy.fPort, kProbeSeconds);
@@ -82,7 +82,7 @@ void ExplainNoConnection(TOutcome& outcome, TRemote const& proxy) {
     outcome.fReason = Printable(why);
 }
 
-// Something may come back from the proxy itself: its refusal, or that it cannot reach the page. So the page has to be the one.
+// The proxy may return a page of its own, such as a refusal, so the page is searched for its text.
 TOutcome Check(TRemote const& proxy, TArguments const& arguments) {
   TScratchDirectory const scratch("zep-proxy-check");  // the library writes the page into the working directory
   std::string const pageFile = scratch.Path("content.html");
@@ -98,7 +98,7 @@ TOutcome Check(TRemote const& proxy, TArguments const& arguments) {
   if (outcome.fExit != kExitComplete && !isCut) return outcome;
   if (HoldsText(pageFile, ZEP_PROXY_CHECK_TEXT)) return {};
   std::string const size = isCut ? ", and is larger than " + ExactSizeText(arguments.fMostBytes) + " (--max-page)" : "";
-  return {kZEPStatusAccessDenied, kExitNothing, "the page did not come through; " + AnswerIn(BeginningOf(pageFile)) + size};
+  return {kZEPStatusAccessDenied, kExitNothing, "the expected page was not returned; " + AnswerIn(BeginningOf(pageFile)) + size};
 }
 
 int Tell(std::string const& proxy, TOutcome const& outcome, bool asJson, bool quiet) {
@@ -135,10 +135,10 @@ TRun AddProxyCheckArguments(CLI::App& command) {
                 "The most bytes of the page that are fetched (1 MiB), such as 500K or 2M; 0: no limit");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
-      "A web page is fetched through the proxy; the check is passed when it is that page which comes back.\n"
+      "Fetches a web page through the proxy and checks that this page, not another one, is returned.\n"
       "The password comes from netrc or from a prompt.\n"
-      "Exit status: 0 when the page came back, 1 when something else did, 64 for wrong usage, 68 when the proxy is unknown or\n"
-      "does not answer, 69 without libcurl, 75 when nothing moved for too long.");
+      "Exit status: 0 when the page was returned, 1 when another page or nothing was, 64 for wrong usage, 68 when the proxy\n"
+      "is unknown or does not answer, 69 without libcurl, 75 when nothing moved for too long.");
   return [arguments] { return ProxyCheck(*arguments); };
 }
 

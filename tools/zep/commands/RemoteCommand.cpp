@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// zep remote: the identity of remote servers, asked of their management controllers.
+// zep remote: the identity of remote servers, from their management controllers.
 
 #include "IIPMILan.h"
 #include "TLogger.h"
@@ -41,8 +41,8 @@ struct TArguments {
   bool fAsJson = false;
 };
 
-// The lines of the file that are neither empty nor comments, without blanks around them. One that is not a host may hold a
-// password: its place is reported instead.
+// The lines of the file that are neither empty nor comments, without blanks around them. A line that is not a host may contain a
+// password, so it is replaced by its line number.
 std::vector<std::string> HostsIn(std::string const& path) {
   errno = 0;
   std::ifstream file(path);
@@ -61,7 +61,7 @@ std::vector<std::string> HostsIn(std::string const& path) {
   return hosts;
 }
 
-// The line on standard error that tells how far a list is. On a terminal it is written over and over, elsewhere once.
+// The progress line on standard error. On a terminal it is overwritten; otherwise it is printed once, at the end.
 class TProgress {
 public:
   explicit TProgress(std::size_t hosts) : fHosts(hosts), fIsTerminal(CanRedrawErrors()) {}
@@ -83,8 +83,8 @@ private:
   std::chrono::steady_clock::time_point fLast;
 };
 
-// Why the open file is not one that only its owner, who is the caller, can read; empty when it is. It may come to hold
-// passwords.
+// Why users other than the caller might read the open file; empty when only the caller can. The file may contain passwords
+// later.
 std::string WhyNotPrivate(int file) {
   struct stat status {};
   if (::fstat(file, &status) != 0) return std::strerror(errno);
@@ -101,7 +101,7 @@ std::string WhyNotOpened(int error) {
   return error == ENXIO ? "it is not a regular file" : std::strerror(error);
 }
 
-// The library opens the file that was looked at here, whatever the path leads to by then.
+// The library opens the file that was checked here, even when the path leads elsewhere by then.
 void WriteDebugLog(std::string const& path) {
   static TDescriptor file;  // to the end of the program
   file = TDescriptor(::open(path.c_str(), O_WRONLY | O_CREAT | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC, 0600));
@@ -172,23 +172,23 @@ TRun AddRemoteArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command.add_option("host", arguments->fHost, "The controller's host name or address");
   command.add_option("--hosts", arguments->fHostsFile,
-                     "Ask every host that this file names, one a line; print one JSON object a line");
+                     "Query every host that this file names, one per line; print one JSON document per line");
   command.add_option("--user", arguments->fUser, "The account on the controllers")->required();
   command.add_option("--password-file", arguments->fPasswordFile, "The file whose first line is the account's password");
-  command.add_option("--parallel", arguments->fParallel, "How many hosts of a file to ask at once")
+  command.add_option("--parallel", arguments->fParallel, "How many hosts of a file to query at once")
       ->check(CLI::Range(1, 1000))
       ->capture_default_str();
-  command.add_option("--timeout", arguments->fTimeoutSeconds, "The time for each host, in seconds")
+  command.add_option("--timeout", arguments->fTimeoutSeconds, "The time limit for each host, in seconds")
       ->check(CLI::Range(1, 3600))
       ->capture_default_str();
   command.add_option("--debug-log", arguments->fDebugLog,
-                     "Write what the library logs, debug lines too, to this file, for its\nowner only");
+                     "Write the library's log, with debug lines, to this file, which only\nits owner can read");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.footer(
-      "Asks the management controller of a server for machine type, model and serial number, over IPMI on the LAN (UDP\n"
-      "port 623). The password comes from --password-file, else from the environment variable ZEP_BMC_PASSWORD, else it\n"
-      "is asked for; there is no option for it, because others see a command line.\n"
-      "Exit status: 0 when everything was told, 2 when something is missing, 1 when nothing was told, 64 for wrong usage.");
+      "Queries the management controller of a server for machine type, model and serial number, over IPMI on the LAN (UDP\n"
+      "port 623). The password comes from --password-file, otherwise from the environment variable ZEP_BMC_PASSWORD,\n"
+      "otherwise from a prompt; there is no option for it, because other users can read command lines.\n"
+      "Exit status: 0 when everything is known, 2 when something is missing, 1 when nothing is known, 64 for wrong usage.");
   return [arguments] { return Remote(*arguments); };
 }
 

@@ -37,7 +37,8 @@ struct TArguments {
   std::string fMedium;  // the device to write to; empty for standard output
 };
 
-// Where it is still mounted. Also unmounts a medium that could not be written; the reason for that is the one that counts.
+// Returns where the medium is still mounted. Unmounts also a medium that could not be written; the failed write is then the
+// reason that is thrown.
 std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::string const& name, std::string const& text) {
   try {
     medium.Write(name, text);
@@ -56,7 +57,7 @@ std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::stri
   }
 }
 
-// Returns the document that tells of it.
+// Returns the document about the medium.
 TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
   std::string const name = ReportFileName(report, arguments.fAsJson ? ".json" : ".txt");
   std::string const text = arguments.fAsJson ? AsVerbatimText(ReportAsJson(report)) : ReportAsText(report);
@@ -73,20 +74,20 @@ TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
   return document;
 }
 
-// The report's document, or that of the medium which the report was written to. For people it is printed by now.
+// Returns the document of the report, or of the medium to which it was written. Without --json the report is printed here.
 TJson PrintOrWrite(TReport const& report, TArguments const& arguments) {
   if (!arguments.fMedium.empty()) return WriteToMedium(report, arguments);
   if (!arguments.fAsJson) WriteOutput(ReportAsText(report));
   return arguments.fAsJson ? ReportAsJson(report) : TJson();
 }
 
-// Adds what became of sending. A report that was not sent makes all of it a failure.
+// Adds the result of sending. A report that was not sent makes the command fail.
 void AddSending(TJson& document, TSentReport const& sent) {
   TTransferred const& transferred = sent.fTransferred;
   bool const isSent = transferred.fOutcome.fExit == kExitComplete;
   if (!isSent) {
     document["exitStatus"] = static_cast<int>(transferred.fOutcome.fExit);
-    document["reason"] = "it was not sent: " + transferred.fOutcome.fReason;
+    document["reason"] = "the report was not sent: " + transferred.fOutcome.fReason;
   }
   document["sent"] = {{"url", OrNull(transferred.fUrl)},
                       {"bytes", isSent ? TJson(transferred.fBytes) : TJson(nullptr)},
@@ -130,18 +131,19 @@ int Report(TArguments const& arguments) {
 TRun AddReportArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
-  command.add_flag("--sample", arguments->fSample, "Report on the bundled table of an invented server, labelled SAMPLE");
-  command.add_option("--to-media", arguments->fMedium,
-                     "Write the report to a file on this removable device, such as /dev/sdb, instead, and unmount it");
+  command.add_flag("--sample", arguments->fSample, "Report on the bundled sample, an invented server, labelled SAMPLE");
+  command.add_option(
+      "--to-media", arguments->fMedium,
+      "Write the report to a file on this removable device, such as /dev/sdb, instead of printing it, and\nunmount the device");
   command.add_option("--send", arguments->fTarget,
-                     "Send the JSON document, packed, as well: ftp://[USER@]HOST[:PORT]/DIRECTORY/, sftp://..., or\n"
-                     "[USER@]HOST[:PORT] alone. When it cannot be sent it is kept, and where is said");
+                     "Also send the JSON document, compressed: ftp://[USER@]HOST[:PORT]/DIRECTORY/, sftp://..., or\n"
+                     "[USER@]HOST[:PORT] alone. A report that cannot be sent is kept in a file, whose path is printed");
   command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
-      "Exit status: 0 when the identity is complete (the details do not count), 2 when something of it is missing or a\n"
-      "plug-in failed, 1 when nothing of it could be told or the medium could not be written and unmounted, 64 for wrong\n"
-      "usage; when it could not be sent, as that of zep send.");
+      "Exit status: 0 when the identity is complete (the details do not count), 2 when a part of it is missing or a\n"
+      "plug-in failed, 1 when no part of it is known or the medium could not be written and unmounted, 64 for wrong\n"
+      "usage; when the report could not be sent, the exit status of zep send.");
   return [arguments] { return Report(*arguments); };
 }
 

@@ -32,7 +32,7 @@ struct TArguments {
   bool fAsJson = false;
 };
 
-// As execvp looks for it; where PATH is missing it has its own.
+// Searches as execvp does, which has a search path of its own when PATH is missing.
 bool IsFound(std::string const& program) {
   if (program.find('/') != program.npos) return ::access(program.c_str(), F_OK) == 0;
   char const* const path = std::getenv("PATH");
@@ -43,7 +43,7 @@ bool IsFound(std::string const& program) {
   return false;
 }
 
-// The library tells only that a command failed, not how.
+// The library reports only that a command failed, not how.
 std::string WhyItFailed(std::string const& program, int timeout) {
   if (!IsFound(program))
     return program.find('/') != program.npos ? program + " does not exist"
@@ -80,15 +80,15 @@ TRun AddRunArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command
       .add_option("--timeout", arguments->fTimeoutSeconds,
-                  "The longest silence allowed, in seconds; -1, the default, waits for ever")
+                  "The longest silence allowed, in seconds; -1, the default, waits forever")
       ->check(CLI::Range(kForEver, std::numeric_limits<int>::max()));
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document, with the output in it");
-  command.prefix_command();  // all from the first word that is none of the options is the command's
+  command.prefix_command();  // the first word that is not an option begins the command
   command.footer(
       "zep run [OPTIONS] [--] COMMAND [ARGUMENT]...\n"
-      "What the command prints, on standard output and standard error, is printed when it has ended. A zero byte\n"
-      "cuts off the rest of the chunk in which it came. Passwords in URLs, and those that zep was given, come out as ***.\n"
-      "Exit status: 0 when the command ran to its end and exited with 0, 1 when not, 64 for wrong usage.");
+      "The output of the command, on standard output and standard error, is printed when it has ended. A zero byte\n"
+      "cuts off the rest of its chunk. Passwords in URLs, and those that zep was given, are printed as ***.\n"
+      "Exit status: 0 when the command exited with 0, 1 when it did not, 64 for wrong usage.");
   return [&command, arguments] { return RunCommandLine(command.remaining(), *arguments); };
 }
 

@@ -22,7 +22,7 @@ struct TArguments {
 };
 
 int Send(TArguments const& arguments) {
-  if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the file comes first, and where it goes behind it");
+  if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the file comes first, the target second");
   TTarget const target = TargetOf(arguments.fTarget, arguments.fBySftp);
   std::string const& path = target.fRemote.fPath;
   bool const isNamed = !path.empty() && path.back() != '/';
@@ -41,17 +41,16 @@ TRun AddSendArguments(CLI::App& command) {
   command.add_option("target", arguments->fTarget, "ftp://[USER@]HOST[:PORT]/PATH, sftp://..., or [USER@]HOST[:PORT] alone")
       ->required();
   command.add_option("--as", arguments->fName,
-                     "The name there, instead of the file's own, for a host or a URL that ends in \"/\"");
+                     "The name on the server, instead of the file's own, for a host or a URL that ends in \"/\"");
   command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
-      "Missing directories are made on the server. The file is sent under its name with a number and \".part\" after it, and is\n"
-      "renamed when all has arrived; a file or link of that name is then replaced by a new file, a directory never. The new "
-      "file\n"
-      "has the mode of the replaced one where an SFTP server reports it, else the mode that the server gives to new files.\n"
-      "Where the server refuses to rename, the file is sent to its place itself. A host gets the file in the directory of the "
-      "user, or, when ZEP_ISBOOTABLE is \"yes\", in\n"
+      "Missing directories are created on the server. The file is sent under a temporary name, which ends in a number and\n"
+      "\".part\", and is renamed when the upload is complete. A file or link of that name is then replaced by a new file, a\n"
+      "directory never. The new file has the mode of the replaced one if an SFTP server reports it, otherwise the mode that\n"
+      "the server gives to new files. If the server refuses to rename, the file is sent to its final name directly. On a host\n"
+      "given without a path the file goes to the directory of the user, or, when ZEP_ISBOOTABLE is \"yes\", to\n"
       "hostline/toqrv/vantor/fdr_upload.\n" +
       TransferHelp() + " 2 when the file changed while it was sent.");
   return [arguments] { return Send(*arguments); };

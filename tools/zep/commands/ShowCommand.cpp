@@ -41,14 +41,14 @@ struct TArguments {
   std::string fMofFile;
 };
 
-// The namespace that a path names in front of its class; empty when it names none.
+// The namespace that a path names before its class; empty when it names none.
 std::string NamespaceOf(std::string const& path) {
   std::size_t const end = path.find_first_of(":\"");
   return end != std::string::npos && path[end] == ':' ? path.substr(0, end) : "";
 }
 
-// The instance of which zep prints that path, in a document or else on a terminal. Not every printed path can be read: that
-// of a key which is a reference stands raw, bytes that are no UTF-8 are escaped, and an instance without keys has a number.
+// The instance whose path zep prints like this, in a document or else on a terminal. Not every printed path can be parsed: a key
+// that is a reference is printed raw, bytes that are not UTF-8 are escaped, and an instance without keys has a number.
 boost::shared_ptr<ICIMElement> FindPrinted(TNamespaceView const& view, std::string const& full) {
   std::string const path = full.substr(view.GetName().size() + 1);
   std::size_t const endOfClass = path.find_first_of(".#");
@@ -71,7 +71,7 @@ boost::shared_ptr<ICIMElement> FindRead(TNamespaceView const& view, std::string 
   }
 }
 
-// What the path names in that namespace; empty when there is no such thing.
+// The instance or class that the path names in that namespace; empty when there is none.
 boost::shared_ptr<ICIMElement> Find(TNamespaceView const& view, std::string const& path) {
   std::string const named = NamespaceOf(path);
   if (!named.empty() && named != view.GetName()) return {};
@@ -141,7 +141,7 @@ std::string DescriptionOf(ICIMClass const& cls) {
   return text + "\n";
 }
 
-// What the values of the enumerated properties mean.
+// The words for the values of the enumerated properties.
 std::string ValuesAsText(ICIMClass const& cls, std::vector<boost::shared_ptr<ICIMClass const>> const& lineage) {
   TTable table({24, 54});
   ForEachProperty(cls, lineage, [&](ICIMPropertyDecl const& property) {
@@ -166,7 +166,7 @@ std::string SignatureOf(ICIMMethodDecl const& method) {
   return NameOf(method.GetReturnType(TCIMContext())) + " " + method.GetName(TCIMContext()) + "(" + parameters + ")";
 }
 
-// Every method, inherited ones too; one that a class declares again is shown as it is declared last.
+// Every method, including inherited ones; of a method that is declared again, the lowest declaration.
 std::vector<boost::shared_ptr<ICIMMethodDecl>> MethodsOf(std::vector<boost::shared_ptr<ICIMClass const>> const& lineage) {
   std::vector<boost::shared_ptr<ICIMMethodDecl>> methods;
   std::map<std::string, std::size_t> numbers;  // in methods, by name
@@ -265,7 +265,7 @@ std::string ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElem
 }
 
 struct TSearch {
-  std::string fText;                   // of what was found; empty when nothing was
+  std::string fText;                   // the object as it is printed; empty when there is none
   std::vector<std::string> fFailures;  // of the providers
 };
 
@@ -305,13 +305,11 @@ int Show(TArguments const& arguments) {
 
 TRun AddShowArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
-  command
-      .add_option("path", arguments->fPath,
-                  "A class, such as CIM_Chassis, or the path of an object as zep report --json prints it")
+  command.add_option("path", arguments->fPath, "A class, such as CIM_Chassis, or an object path that zep report --json prints")
       ->required();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
-  auto* const mof = command.add_option("--mof", arguments->fMofFile, "Show what this MOF file declares, not what providers have");
-  command.add_flag("--sample", arguments->fSample, "Show objects of the bundled table of an invented server, labelled SAMPLE")
+  auto* const mof = command.add_option("--mof", arguments->fMofFile, "Search this MOF file instead of the providers");
+  command.add_flag("--sample", arguments->fSample, "Show objects of the bundled sample, an invented server, labelled SAMPLE")
       ->excludes(mof);
   command.footer("Exit status: 0 when there is such an object, 1 when there is none, 64 for wrong usage.");
   return [arguments] { return Show(*arguments); };

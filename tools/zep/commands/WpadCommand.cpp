@@ -38,7 +38,7 @@ struct TArguments {
 struct TFindings {
   TSearch fSearch;
   bool fStoppedClients = false;
-  std::optional<TPacFile> fPacFile;  // when it was asked for and there is a URL
+  std::optional<TPacFile> fPacFile;  // with --fetch, when there is a URL
 
   bool IsComplete() const { return !fSearch.fUrl.empty() && (!fPacFile || fPacFile->fFailure.empty()); }
   EExitStatus ExitStatus() const { return fSearch.fUrl.empty() ? kExitNothing : IsComplete() ? kExitComplete : kExitPartial; }
@@ -53,14 +53,14 @@ std::vector<std::string> LinesOf(std::string const& text) {
   return lines;
 }
 
-void TellWhatWillHappen(std::vector<std::string> const& clients) {
+void AnnounceStop(std::vector<std::string> const& clients) {
   std::cerr << "This ends the DHCP clients of this machine: every process with \"dhclient\" in its line of \"ps -e\".\n";
   for (std::string const& line : clients) std::cerr << "  " << Printable(line) << "\n";
   if (clients.empty()) std::cerr << "  (none runs now)\n";
 }
 
 bool IsConfirmed() {
-  std::cerr << "Go on? [y/N] " << std::flush;
+  std::cerr << "Continue? [y/N] " << std::flush;
   std::string answer;
   std::getline(std::cin, answer);
   return answer == "y" || answer == "Y" || answer == "yes";
@@ -68,7 +68,7 @@ bool IsConfirmed() {
 
 // ---- The countdown ----
 
-// On a terminal only, on standard error, and wiped away at the end.
+// Shown on standard error, only on a terminal, and erased at the end.
 class TCountdown {
 public:
   ~TCountdown() {
@@ -93,7 +93,7 @@ std::string NameOf(TAsking const& asking) {
   return asking.fInterface + (asking.fIsUp ? "" : ", down") + (asking.fIsPromiscuous ? ", promiscuous" : "");
 }
 
-std::string WhatCameBack(TAsking const& asking) {
+std::string ReplyOf(TAsking const& asking) {
   if (asking.fReply) {
     TReply const& reply = *asking.fReply;
     return std::to_string(reply.fSize) + " bytes from " + reply.fSender + " after " + std::to_string(reply.fMilliseconds) +
@@ -102,12 +102,12 @@ std::string WhatCameBack(TAsking const& asking) {
   return asking.fFailure.empty() ? "nothing within " + std::to_string(kReplySeconds * asking.fSent) + " s" : asking.fFailure;
 }
 
-std::string WhatWasSent(TAsking const& asking) {
+std::string MessagesOf(TAsking const& asking) {
   if (asking.fSent == 0) return "nothing";
   return std::to_string(asking.fSent) + " x " + std::to_string(AutoProxyDiscovery::kMessageSize) + " bytes";
 }
 
-// A file of whoever serves it, for a terminal.
+// The lines of a file from the network, made safe for a terminal.
 std::string PrintableLines(std::string const& text) {
   std::string printable;
   for (std::string line : LinesOf(text)) {
@@ -125,20 +125,20 @@ std::string AsText(TFindings const& findings) {
     TTable table({16, 16, 14, 28});
     table.Add({"Interface", "Address", "Sent", "Came back"});
     for (TAsking const& asking : findings.fSearch.fAskings)
-      table.Add({NameOf(asking), asking.fAddress, WhatWasSent(asking), WhatCameBack(asking)});
+      table.Add({NameOf(asking), asking.fAddress, MessagesOf(asking), ReplyOf(asking)});
     text += (text.empty() ? "" : "\n") + table.GetText();
   }
   if (findings.fPacFile && findings.fPacFile->fFailure.empty()) text += "\n" + PrintableLines(findings.fPacFile->fText);
   return text;
 }
 
-// Empty when nothing is.
-std::string WhatIsMissing(TFindings const& findings) {
+// Why the result is incomplete; empty when it is complete.
+std::string WhyIncomplete(TFindings const& findings) {
   if (findings.fPacFile && !findings.fPacFile->fFailure.empty())
     return "the file was not fetched: " + findings.fPacFile->fFailure;
   if (!findings.fSearch.fUrl.empty()) return "";
   if (findings.fSearch.fAskings.empty()) return "no interface has a name that begins with \"eth\"";
-  return findings.fSearch.fFailure.empty() ? "nobody named a proxy configuration file" : findings.fSearch.fFailure;
+  return findings.fSearch.fFailure.empty() ? "no server returned a proxy configuration URL" : findings.fSearch.fFailure;
 }
 
 TJson AskingAsJson(TAsking const& asking) {
@@ -159,7 +159,7 @@ TJson AskingAsJson(TAsking const& asking) {
 }
 
 std::string AsJson(TFindings const& findings) {
-  TJson document = DocumentHead("zep wpad", findings.ExitStatus(), WhatIsMissing(findings));
+  TJson document = DocumentHead("zep wpad", findings.ExitStatus(), WhyIncomplete(findings));
   document["status"] = NameOf(findings.ExitStatus());
   document["url"] = OrNull(findings.fSearch.fUrl);
   document["stoppedClients"] = findings.fStoppedClients;
@@ -177,15 +177,15 @@ std::string AsJson(TFindings const& findings) {
 
 // ---- The steps ----
 
-// False, with the clients left alone, when the user does not want it. Throws std::runtime_error when a process that is not a DHCP
-// client would be ended: the library reads the same list again for itself.
+// Returns false, and leaves the clients alone, when the user does not confirm. Throws std::runtime_error when a process that is
+// not a DHCP client would be ended: the library reads the same list again.
 bool StopClients(bool isConfirmed) {
   std::vector<std::string> const clients = DhcpClientLines();
-  TellWhatWillHappen(clients);
+  AnnounceStop(clients);
   std::string const why = WhyNotToBeEnded(clients);
   if (!why.empty()) throw std::runtime_error(why);
   if (!isConfirmed && !IsConfirmed()) return false;
-  // Again: the answer may have taken its time.
+  // Checked again, because the user may have taken a while to answer.
   std::string const whyNow = WhyNotToBeEnded(DhcpClientLines());
   if (!whyNow.empty()) throw std::runtime_error(whyNow);
   AutoProxyDiscovery::wpadPreconfig();
@@ -200,7 +200,7 @@ TSearch Search() {
 
 void Tell(TFindings const& findings, bool asJson) {
   WriteOutput(asJson ? AsJson(findings) : AsText(findings));
-  std::string const missing = WhatIsMissing(findings);
+  std::string const missing = WhyIncomplete(findings);
   if (!missing.empty()) std::cerr << "zep: " << Printable(missing) << "\n";
 }
 
@@ -221,18 +221,19 @@ int Wpad(TArguments const& arguments) {
 TRun AddWpadArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
-  command.add_flag("--fetch", arguments->fFetches, "Fetch the file too, through plain HTTP by libcurl, and print it");
+  command.add_flag("--fetch", arguments->fFetches, "Also fetch the file, over plain HTTP with libcurl, and print it");
   AddSizeOption(command, "--max-file", arguments->fMostBytes,
                 "The most bytes of the file that are fetched (1 MiB), such as 500K or 2M; 0: no limit");
   auto* const yes = command.add_flag("--yes", arguments->fIsConfirmed, "End the DHCP clients without asking");
   command
-      .add_flag("--no-stop", arguments->fKeepsClients, "Leave the DHCP clients alone; while one holds port 68, nothing is heard")
+      .add_flag("--no-stop", arguments->fKeepsClients,
+                "Leave the DHCP clients running; while one holds port 68, no answer can be received")
       ->excludes(yes);
   command.footer(
-      "Asks the DHCP server, by a broadcast about each interface whose name begins with \"eth\", for the address of the\n"
-      "proxy configuration file (option 252), and prints it. Only root may listen for the answer, and only one program\n"
-      "of a machine: the running DHCP clients are ended first. An interface without an answer takes 18 s.\n"
-      "Exit status: 0 when there is an address (and the file, if asked for), 2 without the file, 1 when there is none,\n"
+      "Queries the DHCP server, by a broadcast for each interface whose name begins with \"eth\", for the URL of the proxy\n"
+      "configuration file (option 252), and prints it. Only root may listen for the answer, and only one program at a time:\n"
+      "the running DHCP clients are ended first. An unanswered query takes 18 seconds: three attempts of six.\n"
+      "Exit status: 0 when there is a URL (with --fetch: and the file), 2 when the file is missing, 1 when there is no URL,\n"
       "64 for wrong usage.");
   return [arguments] { return Wpad(*arguments); };
 }

@@ -5,21 +5,21 @@
 
 namespace NQRVZEP20::zep {
 
-// What zep ends with, whatever the command. docs/formats.md has the table.
+// The exit statuses of all commands. docs/formats.md has the table.
 enum EExitStatus {
-  kExitComplete = 0,  // everything that was asked for
-  kExitNothing = 1,   // nothing of it
-  kExitPartial = 2,   // some of it; the output says what is missing, and why
-  kExitUsage = 64,    // zep was called in a way that it does not know
+  kExitComplete = 0,  // everything was done
+  kExitNothing = 1,   // nothing was done
+  kExitPartial = 2,   // a part was done; the output states what is missing, and why
+  kExitUsage = 64,    // wrong usage
 
-  // Of transfers only, which end with kExitNothing when the server refuses them or they break off:
-  kExitNoInput = 66,       // the file to be sent cannot be read
-  kExitNoConnection = 68,  // the host is unknown, or nobody answers there
-  kExitNoLibrary = 69,     // there is no libcurl, or none that will do
-  kExitNotWritten = 73,    // the local file is there already, or cannot be written
-  kExitStalled = 75,       // nothing moved any more
+  // Only of transfers, which end with kExitNothing when the server refuses them or they fail halfway:
+  kExitNoInput = 66,       // the file to send cannot be read
+  kExitNoConnection = 68,  // the host is unknown or does not answer
+  kExitNoLibrary = 69,     // libcurl is missing or unsuitable
+  kExitNotWritten = 73,    // the local file exists already, or cannot be written
+  kExitStalled = 75,       // nothing moved for too long
 
-  // In documents only: zep dies of the signal that interrupted it, which a shell shows as this number.
+  // Only in documents: zep dies of the signal that interrupted it, which a shell reports as this number.
   kExitHangUp = 129,
   kExitInterrupt = 130,
   kExitTermination = 143
@@ -36,7 +36,7 @@ inline EExitStatus ExitStatusOf(ECompleteness completeness) {
   }
 }
 
-// For programs: what it says of what was asked for. Every failure is "nothing".
+// For programs: how much was done. Every failure is "nothing".
 inline char const* NameOf(EExitStatus status) {
   switch (status) {
     case kExitComplete:

@@ -10,19 +10,19 @@
 
 namespace NQRVZEP20::zep {
 
-// Ends zep with that status. The text gives the cause and, where there is one, the remedy, and shows no password.
+// Ends zep with that status. The text states the cause and, where there is one, the remedy; it contains no password.
 struct TFailure : std::runtime_error {
   TFailure(EExitStatus status, std::string const& why) : std::runtime_error(why), fStatus(status) {}
 
   EExitStatus fStatus;
 };
 
-// zep was called in a way that it does not know.
+// Wrong usage.
 struct TWrongUsage : TFailure {
   explicit TWrongUsage(std::string const& why) : TFailure(kExitUsage, why) {}
 };
 
-// The exit status for what was thrown: a TFailure's own, kExitNothing for all else.
+// The exit status for an exception: that of a TFailure, kExitNothing for all others.
 inline EExitStatus StatusOf(std::exception const& thrown) {
   auto const* const failure = dynamic_cast<TFailure const*>(&thrown);
   return failure != nullptr ? failure->fStatus : kExitNothing;

@@ -27,7 +27,7 @@ TJson ArrayAsJson(std::vector<TCIMValue> const& elements) {
   return array;
 }
 
-// The word for the value, or those for the elements of an array; null where there is none.
+// The word for the value, or the words for the elements of an array; null where there is none.
 TJson WordsAsJson(TValueWords const& words, TCIMValue const& value) {
   if (words.Entries().empty() || value.IsNull()) return nullptr;
   if (!value.IsArray()) return OrNull(words.WordFor(value));
@@ -52,7 +52,7 @@ TJson PropertyAsJson(TNamespaceView const& view, ICIMInstance const& instance, I
   return json;
 }
 
-// The members that hold messages, or repeat arguments. All others hold data, which stays as it is.
+// Whether the member contains a message or repeats an argument. All others contain data, which is printed unchanged.
 bool IsMessage(std::string const& key) {
   constexpr char const* kMessages[] = {"reason", "error", "failure", "host", "url", "proxy", "command"};
   return std::find(std::begin(kMessages), std::end(kMessages), key) != std::end(kMessages);

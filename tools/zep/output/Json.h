@@ -16,7 +16,7 @@ namespace NQRVZEP20::zep {
 
 using TJson = nlohmann::ordered_json;
 
-// The version of the documents that zep prints. It grows when a program that reads them would notice.
+// The version of the documents of zep. It grows when a program that reads them would notice the change.
 constexpr int kDocumentVersion = 2;
 
 // The head of every document: what it is, its version, whether it is about the sample, the exit status, and why that is not
@@ -35,18 +35,18 @@ std::string AsVerbatimText(TJson const& document);
 // The text; null for an empty one.
 TJson OrNull(std::string const& text);
 
-// The document of a command that failed before it had one of its own: the head alone, in one line.
+// The document of a command that failed early: only the head, in one line.
 std::string FailureAsJson(std::string const& what, EExitStatus status, std::string const& reason,
                           std::string const& sampleLabel = "");
 
-// Booleans and numbers become their JSON kinds, arrays arrays, NULL null, and all others their text. So do integers of 64 bits,
-// which many programs read as reals of 53 bits, and a real that is not finite.
+// Booleans, numbers, arrays and NULL become the same kind of JSON; all other values become texts. 64-bit integers become texts,
+// too, because many programs read them as reals of 53 bits; so do reals that are not finite.
 TJson ValueAsJson(TCIMValue const& value);
 
-// The type's name, with "[]" behind it for an array.
+// The name of the type, followed by "[]" for an array.
 std::string NameOf(TCIMValue::TCIMType type);
 
-// An instance with its path and all properties: type, value, source, and why there is no value.
+// An instance with its path and all properties: type, value, source, and for a missing value the reason.
 TJson InstanceAsJson(TNamespaceView const& view, ICIMInstance const& instance);
 
 }  // namespace NQRVZEP20::zep

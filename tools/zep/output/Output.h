@@ -7,19 +7,19 @@
 
 namespace NQRVZEP20::zep {
 
-// Writes the text to standard output, whole and verbatim: values that providers, files and tables report, and documents, whose
-// messages hide passwords already (AsText). Throws std::system_error when that fails, as on a full disk; a reader who went away
-// ends the program by SIGPIPE, unless the caller of zep has that signal ignored.
+// Writes the complete text to standard output, verbatim: values that providers, files and tables report, and documents, whose
+// messages hide passwords already (AsText). Throws std::system_error when that fails, as on a full disk. When the reader has
+// closed the pipe, the program ends by SIGPIPE, unless the caller of zep ignores that signal.
 void WriteOutput(std::string const& text);
 
-// The same for a text that repeats arguments, which may hold a password (MessageWithoutSecrets).
+// The same for a text that repeats arguments, which may contain a password (MessageWithoutSecrets).
 void WriteMessage(std::string const& text);
 
-// Whether any of the two was called: with --json a document is printed then, in part at least.
+// Whether one of the two was called: with --json, a document was then printed, at least in part.
 bool HasWrittenOutput();
 
-// For as long as it lives, what anyone else in this process prints to standard output goes to standard error: plug-ins
-// must not write into a document.
+// While it exists, everything that is printed to standard output goes to standard error, so that plug-ins do not write into a
+// document.
 class TOutputGuard {
 public:
   TOutputGuard();
@@ -28,7 +28,7 @@ public:
   TOutputGuard& operator=(TOutputGuard const&) = delete;
 
 private:
-  TDescriptor fOutput;  // the real standard output, when there is one
+  TDescriptor fOutput;  // the original standard output; empty when that was closed
 };
 
 }  // namespace NQRVZEP20::zep

@@ -6,23 +6,23 @@
 
 namespace NQRVZEP20::zep {
 
-// How text for people is laid out where it goes.
+// The layout of text for people.
 enum class ELayout {
-  kFile,      // standard output is not a terminal: lines as wide as the columns ask for
+  kFile,      // standard output is not a terminal: columns have their fixed widths
   kTerminal,  // lines as wide as the terminal
   kPlain      // TERM is "dumb": a row of a table is one line, however long
 };
 
 ELayout OutputLayout();
 
-// How many columns a line on standard output has: those of the terminal, as COLUMNS or the system tells them, else 80. With
-// kPlain there is no limit.
+// The width of a line on standard output, in columns: that of the terminal, from COLUMNS or the system, otherwise 80. With kPlain
+// there is no limit.
 std::size_t OutputWidth();
 
-// Whether a line can be written over and over on standard error: it is a terminal, and not a dumb one.
+// Whether a line on standard error can be overwritten: standard error is a terminal, and TERM is not "dumb".
 bool CanRedrawErrors();
 
-// The number that COLUMNS has; 0 when it is not a number from 20 to 1000.
+// The number in the text of COLUMNS; 0 when it is not a number from 20 to 1000.
 std::size_t ColumnsFrom(std::string_view text);
 
 }  // namespace NQRVZEP20::zep

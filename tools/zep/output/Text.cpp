@@ -13,7 +13,7 @@ namespace {
 
 std::string WithoutTrailingBlanks(std::string_view text) { return std::string(text.substr(0, text.find_last_not_of(' ') + 1)); }
 
-// Looks at no more of the text than it has to.
+// Stops at the first character that is too many, because the text may be long.
 bool IsWiderThan(std::string_view text, std::size_t width) {
   std::size_t characters = 0;
   for (char const c : text)
@@ -21,7 +21,8 @@ bool IsWiderThan(std::string_view text, std::size_t width) {
   return false;
 }
 
-// Where to break a text that is wider than `width`: at the last blank that leaves no more than that, else within the word.
+// The place to break a text that is wider than `width`: the last blank that leaves a line of at most `width`, otherwise within
+// the word.
 std::size_t BreakOf(std::string_view text, std::size_t width) {
   std::size_t end = 0;
   for (std::size_t characters = 0; characters < width; ++characters)
@@ -36,7 +37,7 @@ constexpr std::size_t kGap = 2;  // between two columns
 
 using TWidths = std::vector<std::size_t>;
 
-// Blanks at the start belong to the first word.
+// Leading blanks belong to the first word.
 std::size_t LongestWordIn(std::string_view cell) {
   std::size_t longest = 0, start = 0;
   std::size_t word = std::min(cell.find_first_not_of(' '), cell.size());
@@ -52,7 +53,7 @@ std::size_t LineWidthOf(TWidths const& widths) {
   return std::accumulate(widths.begin(), widths.end(), kGap * (widths.size() - 1));
 }
 
-// The column in which the first number exceeds the second by most; none when it does so in no column.
+// The column in which `more` exceeds `less` by the largest amount; none when it exceeds it nowhere.
 std::optional<std::size_t> WidestDifference(TWidths const& more, TWidths const& less) {
   std::optional<std::size_t> widest;
   for (std::size_t at = 0; at < more.size(); ++at)
@@ -105,7 +106,7 @@ std::string SizeText(std::uint64_t bytes) {
   constexpr char const* units[] = {"B", "KiB", "MiB", "GiB", "TiB"};
   double size = static_cast<double>(bytes);
   std::size_t unit = 0;
-  for (; unit + 1 < std::size(units) && size >= 1023.95; ++unit) size /= 1024;  // what would be rounded to 1024
+  for (; unit + 1 < std::size(units) && size >= 1023.95; ++unit) size /= 1024;  // 1023.95 and more would be rounded to 1024
   long const tenths = std::lround(size * 10);
   std::string const digit = tenths % 10 == 0 ? "" : "." + std::to_string(tenths % 10);
   return std::to_string(tenths / 10) + digit + " " + units[unit];
@@ -128,7 +129,7 @@ std::vector<std::size_t> TTable::WidthsFor(ELayout layout, std::size_t lineWidth
   TWidths needed(fWidths.size()), whole(fWidths.size());
   for (auto const& row : fRows)
     for (std::size_t at = 0; at < row.size(); ++at) {
-      // One that would take more than three quarters of the line is cut rather.
+      // A word of more than three quarters of the line is cut instead.
       std::size_t const longest = LongestWordIn(row[at]);
       if (longest <= lineWidth / 4 * 3) needed[at] = std::max(needed[at], longest);
       whole[at] = std::max(whole[at], WidthOf(row[at]));

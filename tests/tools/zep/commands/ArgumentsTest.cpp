@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// What zep says of a command line that it does not take, for every command.
+// The messages of zep for wrong usage, for every command.
 
 #include "tests/tools/zep/Zep.h"
 
@@ -29,7 +29,7 @@ protected:
   TInstallation fZep;
 };
 
-TEST_F(ArgumentsTest, WhatIsWrongIsSaidWithoutTheWordsOfTheCommandLine) {
+TEST_F(ArgumentsTest, WrongUsageIsReportedWithoutRepeatingTheArguments) {
   struct TRow {
     std::vector<std::string> arguments;
     std::string errors;
@@ -63,14 +63,14 @@ TEST_F(ArgumentsTest, WhatIsWrongIsSaidWithoutTheWordsOfTheCommandLine) {
   for (TRow const& row : rows) ExpectWrongUsage(row.arguments, row.errors);
 }
 
-TEST_F(ArgumentsTest, ACommandThatThereIsNotIsNamed) {
+TEST_F(ArgumentsTest, UnknownCommandIsNamed) {
   EXPECT_EQ(Run({"bogus"}).errors, "zep: there is no command \"bogus\"\n");
   EXPECT_EQ(Run({"bogus", "--json"}).errors, "zep: there is no command \"bogus\"\n");
   EXPECT_EQ(Run({"media", "eject"}).errors, "zep: there is no command \"eject\"\n");
   EXPECT_EQ(Run({}).errors, "zep: no command is named; zep --help lists them\n");
 }
 
-TEST_F(ArgumentsTest, NothingOfItReachesTheTerminalRaw) {
+TEST_F(ArgumentsTest, ArgumentsAreEscapedInMessages) {
   for (std::vector<std::string> const& arguments : {std::vector<std::string>{"\x1b[2J"},
                                                     {"--\x1b[2J"},
                                                     {"show", "a", "\x1b[2J"},
@@ -86,7 +86,7 @@ TEST_F(ArgumentsTest, NothingOfItReachesTheTerminalRaw) {
   EXPECT_EQ(Run({"show", "a", "--\x1b[2J"}).errors, "zep: there is no option --\\x1b[2J\n");
 }
 
-TEST_F(ArgumentsTest, WhatIsGivenIsNotEmpty) {
+TEST_F(ArgumentsTest, EmptyArgumentsAreRefused) {
   struct TRow {
     std::vector<std::string> arguments;
     std::string name;

@@ -59,7 +59,7 @@ TEST_F(ConfigTest, ShowsTheSettingsWithTheirLinesAndTheIgnoredLinesWithTheReason
                             "3                                     an empty line\n"
                             "6       server=gamma                  line 2 sets the key, and the first counts\n"
                             "7       =no key                       no key before \"=\"\n"
-                            "8       empty=                        no value behind \"=\"\n");
+                            "8       empty=                        no value after \"=\"\n");
 }
 
 TEST_F(ConfigTest, ShowsOneSettingAndTheIgnoredLinesOfItsKey) {
@@ -89,7 +89,7 @@ TEST_F(ConfigTest, PrintsJson) {
                                                             "reason": "line 1 sets the key, and the first counts"}])"));
 }
 
-TEST_F(ConfigTest, SaysWhyThereIsNothing) {
+TEST_F(ConfigTest, ReportsWhyThereAreNoSettings) {
   TRun run = Run({});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, "");
@@ -120,7 +120,7 @@ TEST_F(ConfigTest, SaysWhyThereIsNothing) {
   EXPECT_EQ(run.errors, "zep: " + File() + " cannot be read\n");
 }
 
-TEST_F(ConfigTest, APipeOfThatNameIsNotWaitedFor) {
+TEST_F(ConfigTest, APipeOfThatNameDoesNotBlock) {
   ASSERT_EQ(::mkfifo(File().c_str(), 0600), 0);
   TRun const run = Run({});
   EXPECT_EQ(run.status, 1);
@@ -141,7 +141,7 @@ TEST_F(ConfigTest, AFileThatCannotBeReadToItsEndIsReportedAsSuch) {
 }
 #endif
 
-TEST_F(ConfigTest, TakesOneKeyOnly) { EXPECT_EQ(Run({"a", "b"}).status, 64); }
+TEST_F(ConfigTest, AcceptsOnlyOneKey) { EXPECT_EQ(Run({"a", "b"}).status, 64); }
 
 }  // namespace
 }  // namespace NQRVZEP20::zep

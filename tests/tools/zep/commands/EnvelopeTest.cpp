@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// The exit status and the JSON document of every command of zep, where it succeeds and where it fails.
+// The exit status and the JSON document of every command of zep, when it succeeds and when it fails.
 
 #include "tests/tools/zep/Envelope.h"
 #include "tests/tools/zep/Zep.h"
@@ -12,7 +12,7 @@
 namespace NQRVZEP20::zep {
 namespace {
 
-// A call with --json, and what it ends with.
+// A call with --json, and its exit status.
 struct TRow {
   std::string document;
   int status;
@@ -49,7 +49,7 @@ protected:
     ExpectEnvelope(run.output, run.status, row.document);
   }
 
-  // The names below "Subcommands:", each after that of the command that they belong to.
+  // The names below "Subcommands:", each after the name of its command.
   std::vector<std::string> NamesIn(std::vector<std::string> const& command) {
     std::vector<std::string> arguments = command;
     arguments.push_back("--help");
@@ -65,7 +65,7 @@ protected:
     return names;
   }
 
-  // "zep media mount" and so on, as zep --help lists them.
+  // All commands that zep --help lists, such as "zep media mount".
   std::set<std::string> Commands() {
     std::set<std::string> commands;
     for (std::string const& name : NamesIn({})) {
@@ -75,7 +75,7 @@ protected:
     return commands;
   }
 
-  // The command that the words name, of those.
+  // The one of those commands that the words name.
   static std::string CommandOf(std::set<std::string> const& commands, std::vector<std::string> const& arguments) {
     std::string command = "zep";
     for (std::string const& argument : arguments)
@@ -83,7 +83,7 @@ protected:
     return command;
   }
 
-  // Which commands have no row and are not among the others either.
+  // The commands that have no row and are not among `others`.
   template <class TRows>
   std::set<std::string> Missing(TRows const& rows, std::set<std::string> const& others) {
     std::set<std::string> const commands = Commands();
@@ -137,7 +137,7 @@ TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
   EXPECT_THAT(Missing(rows, {"zep wpad"}), testing::IsEmpty()) << "zep wpad has a test of its own, below";
 }
 
-// Not as root, who would begin to ask the network.
+// Not as root, whose zep would query the network.
 TEST_F(EnvelopeTest, WpadThatMayNotListenPrintsADocument) {
   TCall call = {{"wpad", "--json", "--no-stop"}};
   call.asNobody = true;
@@ -187,14 +187,14 @@ TEST_F(EnvelopeTest, WrongUsageOfEveryCommandPrintsADocument) {
   for (TRow const& row : rows) Expect(row);
 }
 
-TEST_F(EnvelopeTest, WithoutJsonOrBehindACommandToRunThereIsNoDocument) {
+TEST_F(EnvelopeTest, WithoutJsonOrAfterACommandToRunThereIsNoDocument) {
   EXPECT_EQ(Run({"get", "ftp://127.0.0.1:1/f", "there"}).output, "");
   EXPECT_EQ(Run({"run", "--no-such-option", "true", "--json"}).output, "");
   EXPECT_EQ(Run({"run", "echo", "--json"}).output, "--json\n");
   EXPECT_EQ(Run({"config", "--", "--json"}).output, "");
 }
 
-TEST_F(EnvelopeTest, EachHostOfAListHasADocumentOfItsOwnInALine) {
+TEST_F(EnvelopeTest, EachHostOfAListHasItsOwnDocumentOnOneLine) {
   Write("password", "p\n");
   TRun const run = Run({"remote", "--hosts", "hosts", "--user", "u", "--password-file", "password"});
   EXPECT_EQ(run.status, 1);
@@ -204,21 +204,21 @@ TEST_F(EnvelopeTest, EachHostOfAListHasADocumentOfItsOwnInALine) {
   ASSERT_EQ(LinesOf(failed.output).size(), 1u);
 }
 
-TEST_F(EnvelopeTest, AReportThatIsNotSentSaysSoAndWhereItIsKept) {
+TEST_F(EnvelopeTest, AReportThatIsNotSentNamesTheFileThatKeepsIt) {
   TCall call = {{"report", "--json", "--sample", "--send", "ftp://127.0.0.1:1/d/"}};
   call.environment = {{"TMPDIR", fZep.Path("work")}, {"NETRC", "/dev/null"}};
   TRun const run = fZep.Run(call);
   EXPECT_EQ(run.status, 68);
   auto const document = JsonOf(run);
   EXPECT_EQ(document["status"], "complete");
-  EXPECT_THAT(document["reason"].get<std::string>(), testing::StartsWith("it was not sent: "));
+  EXPECT_THAT(document["reason"].get<std::string>(), testing::StartsWith("the report was not sent: "));
   EXPECT_THAT(document["sent"]["keptIn"].get<std::string>(), testing::StartsWith(fZep.Path("work/zep-report.")));
   EXPECT_TRUE(fs::exists(document["sent"]["keptIn"].get<std::string>()));
   EXPECT_TRUE(document["sent"]["sha256"].is_null());
   EXPECT_EQ(document["sent"]["leftOnServer"], nlohmann::json::array());
 }
 
-TEST_F(EnvelopeTest, ADocumentThatCannotBeWrittenIsNotTriedTwice) {
+TEST_F(EnvelopeTest, ADocumentThatCannotBeWrittenIsWrittenOnlyOnce) {
   TCall call = {{"config", "--json"}};
   call.outputFile = "/dev/full";
   TRun const run = fZep.Run(call);

@@ -48,7 +48,7 @@ protected:
 
 // ---- zep mof ----
 
-TEST_F(MofTest, ASchemaThatIsRightIsCounted) {
+TEST_F(MofTest, ACorrectSchemaIsCounted) {
   TRun const run = Run({"mof", "disks.mof"});
   EXPECT_EQ(run.status, 0) << run.errors;
   EXPECT_EQ(run.output,
@@ -65,7 +65,7 @@ TEST_F(MofTest, ASchemaThatIsRightIsCounted) {
             "Instances                 3\n");
 }
 
-TEST_F(MofTest, TheCountsAreThereAsJson) {
+TEST_F(MofTest, TheCountsAreAvailableAsJson) {
   auto const document = JsonOf(Run({"mof", "--json", "disks.mof"}));
   EXPECT_EQ(document["document"], "zep mof");
   EXPECT_EQ(document["file"], "disks.mof");
@@ -75,7 +75,7 @@ TEST_F(MofTest, TheCountsAreThereAsJson) {
     EXPECT_EQ(document[key], count) << key;
 }
 
-TEST_F(MofTest, WhatIsPrintedCanBeReadAndPrintsTheSame) {
+TEST_F(MofTest, ThePrintedSchemaIsReadAndPrintedIdentically) {
   TRun const first = Run({"mof", "disks.mof", "--print"});
   EXPECT_EQ(first.status, 0);
   EXPECT_THAT(first.output,
@@ -85,7 +85,7 @@ TEST_F(MofTest, WhatIsPrintedCanBeReadAndPrintsTheSame) {
   EXPECT_EQ(Run({"mof", "printed.mof", "--print"}).output, first.output);
 }
 
-TEST_F(MofTest, AMistakeIsToldWithItsPlace) {
+TEST_F(MofTest, AMistakeIsReportedWithItsPlace) {
   WriteFile(fZep.Path("bad.mof"), "class X_A {\n  strin Name;\n};\n");
   TRun const run = Run({"mof", "bad.mof"});
   EXPECT_EQ(run.status, 1);
@@ -98,7 +98,7 @@ TEST_F(MofTest, AMistakeIsToldWithItsPlace) {
   EXPECT_EQ(Run({"mof", "none.mof"}).status, 1);
 }
 
-TEST_F(MofTest, WrongUsageIsToldFromWrongSchemas) {
+TEST_F(MofTest, WrongUsageDiffersFromWrongSchemas) {
   EXPECT_EQ(Run({"mof"}).status, 64);
   EXPECT_EQ(Run({"mof", "disks.mof", "--print", "--json"}).status, 64);
   EXPECT_EQ(Run({"classes", "--mof"}).status, 64);
@@ -139,7 +139,7 @@ TEST_F(MofTest, ClassesAreATree) {
             "  X_Loud (indication)\n");
 }
 
-TEST_F(MofTest, ClassesAreThereAsJson) {
+TEST_F(MofTest, ClassesAreAvailableAsJson) {
   auto const namespaces = JsonOf(Run({"classes", "--json", "--mof", "disks.mof"}))["namespaces"];
   ASSERT_EQ(namespaces.size(), 1u);
   EXPECT_EQ(namespaces[0]["provider"], "disks.mof");
@@ -221,7 +221,7 @@ TEST_F(MofTest, AnInstanceIsShownWithItsValuesInWords) {
   EXPECT_EQ(state["words"], "Degraded");
 }
 
-TEST_F(MofTest, WhatTheFileDoesNotDeclareIsAnError) {
+TEST_F(MofTest, AnUndeclaredObjectIsAnError) {
   TRun const run = Run({"show", "X_Tape", "--mof", "disks.mof"});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: disks.mof has no object \"X_Tape\"\n");
@@ -259,7 +259,7 @@ std::vector<std::string> ConsoleBlocks() {
   return blocks;
 }
 
-TEST_F(MofTest, ThePageOnSchemasShowsWhatIsPrinted) {
+TEST_F(MofTest, ThePageOnSchemasShowsTheActualOutput) {
   auto const blocks = ConsoleBlocks();
   ASSERT_EQ(blocks.size(), 2u);
   TCall call;

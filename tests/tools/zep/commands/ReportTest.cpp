@@ -20,8 +20,8 @@ using testing::IsEmpty;
 using testing::Not;
 using testing::StartsWith;
 
-// The rows of one of the report's tables, each a vector of cells. Cells that went on in further lines are put together
-// again, with nothing in between where a word was broken and a blank elsewhere; `widths` are those of the columns.
+// The rows of one table of the report, each a vector of cells. Cells of several lines are joined with blanks; `widths` are the
+// widths of the columns.
 std::vector<std::vector<std::string>> RowsOf(std::string const& text, std::string const& title,
                                              std::vector<std::size_t> const& widths) {
   std::vector<std::vector<std::string>> rows;
@@ -70,7 +70,7 @@ std::string ValueIn(std::string const& text, std::string const& label) {
   return "no such row";
 }
 
-// What the text shows for an entry of the document.
+// The text that the report for people shows for an entry of the document.
 std::string ValueTextOf(nlohmann::json const& entry) {
   if (entry["value"].is_null())
     return (entry["code"] == "not-applicable" ? "none: " : "unknown: ") + entry["reason"].get<std::string>();
@@ -100,9 +100,9 @@ protected:
   TInstallation fZep;
 };
 
-// ---- What is told ----
+// ---- Identity and details ----
 
-TEST_F(ReportTest, TheMachineOfEachRealTableIsTold) {
+TEST_F(ReportTest, TheMachineOfEachRealTableIsReported) {
   struct TRow {
     char const *table, *machine;
     int status;
@@ -156,16 +156,16 @@ TEST_F(ReportTest, EachRowHasItsValueOrItsReason) {
   for (TRow const& row : rows) EXPECT_EQ(ValueIn(Report(RealTablePath(row.table)).output, row.label), row.value) << row.table;
 }
 
-TEST_F(ReportTest, AProductNameWithoutModelTellsSo) {
+TEST_F(ReportTest, AProductNameWithoutModelIsReportedAsSuch) {
   TRun const run = Report(fZep.Table(SystemInformation("Server X1-[1234]-", "KQ12345") + EndOfTable()));
   EXPECT_EQ(run.status, 2);
   EXPECT_EQ(ValueIn(run.output, "Machine type"), "1234");
-  EXPECT_EQ(ValueIn(run.output, "Model"), "unknown: the product name tells the machine type only");
+  EXPECT_EQ(ValueIn(run.output, "Model"), "unknown: the product name contains only the machine type");
   EXPECT_EQ(LinesOf(run.output)[0], "db1: Server X1, type 1234, model unknown, serial number KQ12345");
 }
 
-// Shapes that many makers' firmware gives; the texts are invented.
-TEST_F(ReportTest, TheSerialNumberOfEveryMakersFormIsShownAndTheIdentityComplete) {
+// Forms that the firmware of many manufacturers has; the texts are invented.
+TEST_F(ReportTest, SerialNumbersOfAllManufacturersAreShownAndCompleteTheIdentity) {
   std::string const longest = "XVM-42 1f 9a 3c 5d 7e 80 21-b3 c4 d5 e6 f7 08 19 2a 3b";
   ASSERT_EQ(longest.size(), 54u);
   struct TRow {
@@ -220,7 +220,7 @@ TEST_F(ReportTest, ASerialNumberOfAnotherFormCompletesTheIdentityOfAnOwnMachine)
   EXPECT_EQ(LinesOf(run.output)[0], "db1: Server Q100, type 1234, model AB7, serial number 9000116105");
 }
 
-TEST_F(ReportTest, OnlyAProductNameWithoutBracketsExplainsThatThereIsNoTypeAndModel) {
+TEST_F(ReportTest, OnlyAProductNameWithoutBracketsHasNoTypeAndModel) {
   struct TRow {
     char const *productName, *machine, *typeCode, *modelCode;  // the code is null for a value
     int status;
@@ -249,7 +249,7 @@ TEST_F(ReportTest, OnlyAProductNameWithoutBracketsExplainsThatThereIsNoTypeAndMo
   }
 }
 
-TEST_F(ReportTest, PlaceholdersOfTheFirmwareAreToldAsSuch) {
+TEST_F(ReportTest, PlaceholdersOfTheFirmwareAreReportedAsSuch) {
   TRun const run = Report(fZep.Table(SystemInformation("To Be Filled By O.E.M.", "System Serial Number") + EndOfTable()));
   EXPECT_EQ(run.status, 2);
   EXPECT_EQ(ValueIn(run.output, "Product name"), "unknown: placeholder text of the firmware: \"To Be Filled By O.E.M.\"");
@@ -271,7 +271,7 @@ TEST_F(ReportTest, ASerialNumberThatWasNeverWrittenIsMissing) {
   }
 }
 
-TEST_F(ReportTest, TwoKindsOfProcessorAndModulesOfUnknownSizeAreToldApart) {
+TEST_F(ReportTest, TwoKindsOfProcessorAndModulesOfUnknownSizeAreDistinguished) {
   std::string const processor =
       "\0\3\1\0"s + std::string(8, '\0') + "\1"s + std::string(7, '\0') + "\x41"s + std::string(23, '\0');
   std::string const module = std::string(8, '\0') + "\0\2"s + std::string(20, '\0');
@@ -285,7 +285,7 @@ TEST_F(ReportTest, TwoKindsOfProcessorAndModulesOfUnknownSizeAreToldApart) {
 
 // ---- Why there are no tables ----
 
-TEST_F(ReportTest, ATableFileThatCannotBeReadSaysWhy) {
+TEST_F(ReportTest, AnUnreadableTableFileHasAReason) {
   TRun const missing = Report(fZep.Path("nothing"));
   EXPECT_EQ(missing.status, 2);
   EXPECT_EQ(LinesOf(missing.output)[0], "db1: not identified: the SMBIOS table file " + fZep.Path("nothing") + " does not exist");
@@ -295,7 +295,7 @@ TEST_F(ReportTest, ATableFileThatCannotBeReadSaysWhy) {
   EXPECT_THAT(LinesOf(garbage.output)[0], EndsWith(" holds no SMBIOS table"));
 }
 
-TEST_F(ReportTest, ATableFileOfAnotherUserSaysWhy) {
+TEST_F(ReportTest, ATableFileOfAnotherUserHasAReason) {
   std::string const table = fZep.Table(RealTable("full"));
   fs::permissions(table, fs::perms::owner_all);
   if (::geteuid() != 0) fs::permissions(table, fs::perms::none);
@@ -309,7 +309,7 @@ TEST_F(ReportTest, ATableFileOfAnotherUserSaysWhy) {
   EXPECT_EQ(LinesOf(run.output)[0], "db1: not identified: the SMBIOS table file " + table + " may not be read by this user");
 }
 
-TEST_F(ReportTest, TheSystemsOwnTablesSayWhyTheyCannotBeRead) {
+TEST_F(ReportTest, UnreadableSystemTablesHaveAReason) {
   fZep.Add("libsmbios.so", FAKE_SMBIOS);
   struct TRow {
     char const *behaviour, *machine, *code;
@@ -332,7 +332,7 @@ TEST_F(ReportTest, TheSystemsOwnTablesSayWhyTheyCannotBeRead) {
   }
 }
 
-TEST_F(ReportTest, WithoutTheSmbiosLibraryTheLinkersReasonIsTold) {
+TEST_F(ReportTest, WithoutTheSmbiosLibraryTheLinkersReasonIsReported) {
   fZep.Remove("libsmbios.so");
   TRun const run = Run({}, {});
   EXPECT_EQ(run.status, 2);
@@ -401,7 +401,7 @@ TEST_F(ReportTest, JsonListsEveryInstanceWithItsPath) {
   EXPECT_EQ(std::unique(paths.begin(), paths.end()), paths.end());
 }
 
-TEST_F(ReportTest, JsonTellsWhyAPropertyIsNull) {
+TEST_F(ReportTest, JsonHasTheReasonForANullProperty) {
   auto const document = JsonOf(Report(RealTablePath("no-serial"), {"--json"}));
   for (auto const& instance : document["instances"]) {
     if (instance["class"] != "QRVSG_ComputerSystem") continue;
@@ -479,7 +479,7 @@ TEST_F(ReportTest, ASampleThatIsNotInstalledIsAnError) {
 
 // ---- Plug-ins ----
 
-TEST_F(ReportTest, WithoutPlugInsNothingIsTold) {
+TEST_F(ReportTest, WithoutPlugInsNothingIsReported) {
   fZep.Remove("libHost.nsp.so");
   TRun const run = Report(RealTablePath("full"));
   EXPECT_EQ(run.status, 1);
@@ -503,7 +503,7 @@ TEST_F(ReportTest, WithoutPlugInsNothingIsTold) {
   EXPECT_EQ(document["identity"]["serialNumber"]["code"], "not-described");
 }
 
-TEST_F(ReportTest, ABrokenPlugInIsToldWithTheLinkersReasonAndStopsNoOther) {
+TEST_F(ReportTest, ABrokenPlugInIsReportedWithTheLinkersReasonAndStopsNoOther) {
   WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
   TRun const run = Report(RealTablePath("full"));
   EXPECT_EQ(run.status, 2);
@@ -523,7 +523,7 @@ TEST_F(ReportTest, ABrokenPlugInIsToldWithTheLinkersReasonAndStopsNoOther) {
   EXPECT_THAT(plugIn["providers"], IsEmpty());
 }
 
-TEST_F(ReportTest, ABrokenPlugInAloneTellsNothing) {
+TEST_F(ReportTest, ABrokenPlugInAloneReportsNothing) {
   fZep.Remove("libHost.nsp.so");
   WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
   TRun const run = Report(RealTablePath("full"));
@@ -531,7 +531,7 @@ TEST_F(ReportTest, ABrokenPlugInAloneTellsNothing) {
   EXPECT_EQ(LinesOf(run.output)[0], "Unnamed machine: not identified: no provider plug-in works");
 }
 
-TEST_F(ReportTest, AProviderThatFailsIsToldAndStopsNoOther) {
+TEST_F(ReportTest, AProviderThatFailsIsReportedAndStopsNoOther) {
   struct TRow {
     char const *behaviour, *result;
   } const rows[] = {
@@ -564,7 +564,7 @@ TEST_F(ReportTest, WhatTheLogSaysOfAFailureIsToldWithIt) {
             WithoutBlanks("provider Test failed: " + error));
 }
 
-TEST_F(ReportTest, ANamespaceThatFailsLaterIsToldWhereItFails) {
+TEST_F(ReportTest, ANamespaceThatFailsLaterIsReportedWhereItFails) {
   fZep.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("fails-later");
   EXPECT_EQ(run.status, 1);
@@ -576,7 +576,7 @@ TEST_F(ReportTest, ANamespaceThatFailsLaterIsToldWhereItFails) {
   EXPECT_EQ(document["instanceFailures"][0]["error"], "it threw something that is not a std::exception");
 }
 
-TEST_F(ReportTest, APlugInThatRegistersNothingIsTold) {
+TEST_F(ReportTest, APlugInThatRegistersNothingIsReported) {
   for (char const* behaviour : {"is-silent", "calls-itself-host"}) {
     TRun const run = RunWithTestProvider(behaviour);
     EXPECT_EQ(run.status, 0) << behaviour;
@@ -584,14 +584,14 @@ TEST_F(ReportTest, APlugInThatRegistersNothingIsTold) {
   }
 }
 
-TEST_F(ReportTest, WhatPlugInsPrintDoesNotGetIntoTheDocument) {
+TEST_F(ReportTest, OutputOfPlugInsStaysOutOfTheDocument) {
   TRun const run = RunWithTestProvider("prints", {"--json"});
   EXPECT_EQ(JsonOf(run)["plugIns"].size(), 2u);
   EXPECT_THAT(run.output, StartsWith("{"));
   EXPECT_THAT(run.errors, AllOf(HasSubstr("noise while loading"), HasSubstr("noise while filling")));
 }
 
-TEST_F(ReportTest, TheFirstProviderThatKnowsAnswers) {
+TEST_F(ReportTest, TheFirstProviderThatKnowsAValueGivesIt) {
   EXPECT_EQ(ValueIn(RunWithTestProvider("one-system").output, "Host name"), "db1");
   fZep.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("one-system");
@@ -610,7 +610,7 @@ TEST_F(ReportTest, TwoSystemsAreNotOneIdentity) {
 
 // ---- Foreign bytes ----
 
-TEST_F(ReportTest, WhatTheFirmwareSaysCannotControlTheTerminal) {
+TEST_F(ReportTest, FirmwareTextCannotControlTheTerminal) {
   std::string const table = fZep.Table(SystemInformation("\x1b]0;owned\x07\x1b[2J\xff Q \xc3\xa9 \xe2\x80\xae -[1234AB7]-",
                                                          "\x9b"
                                                          "31m\n\t") +
@@ -654,7 +654,7 @@ TEST_F(ReportTest, TablesFitIntoEightyColumns) {
   for (TRun const& run : {Report(fZep.Table(SystemInformation(std::string(300, 'x'), std::string(200, 'y')) + EndOfTable())),
                           fZep.Run({{"report", "--sample"}}), Run({}, {})}) {
     auto const lines = LinesOf(run.output);
-    bool isTable = false;  // the head lines stand alone, in front of the first empty one
+    bool isTable = false;  // the head lines come before the first empty line
     for (std::string const& line : lines) {
       isTable = isTable || line.empty();
       if (!isTable) continue;
@@ -665,7 +665,7 @@ TEST_F(ReportTest, TablesFitIntoEightyColumns) {
 
 // ---- Where the output goes ----
 
-TEST_F(ReportTest, AReaderWhoWentAwayEndsItQuietly) {
+TEST_F(ReportTest, AClosedPipeEndsItQuietly) {
   int ends[2];
   ASSERT_EQ(::pipe(ends), 0);
   ::close(ends[0]);
@@ -695,7 +695,7 @@ TEST_F(ReportTest, AFullDiskIsAnError) {
 
 // ---- Arguments ----
 
-TEST_F(ReportTest, WrongUsageIsToldOnStandardError) {
+TEST_F(ReportTest, WrongUsageIsReportedOnStandardError) {
   std::vector<std::string> const calls[] = {{},
                                             {"nonsense"},
                                             {"report", "--nonsense"},
@@ -716,7 +716,7 @@ TEST_F(ReportTest, WrongUsageIsToldOnStandardError) {
   }
 }
 
-TEST_F(ReportTest, HelpAndVersionAreAnswered) {
+TEST_F(ReportTest, HelpAndVersionArePrinted) {
   TRun const version = fZep.Run({{"--version"}});
   EXPECT_EQ(version.status, 0);
   EXPECT_EQ(version.output, "zep " TEST_VERSION " (build " TEST_BUILD_ID ")\n");

@@ -29,7 +29,7 @@ TEST_F(RunTest, PrintsTheOutputOfTheCommand) {
   EXPECT_EQ(run.errors, "");
 }
 
-TEST_F(RunTest, OptionsBehindTheCommandAreTheCommands) {
+TEST_F(RunTest, OptionsAfterTheCommandBelongToTheCommand) {
   TRun const run = Run({"echo", "--timeout", "1", "--help", "-x"});
   EXPECT_EQ(run.status, 0);
   EXPECT_EQ(run.output, "--timeout 1 --help -x\n");
@@ -45,7 +45,7 @@ TEST_F(RunTest, ATimeoutOfZeroAllowsNoSilence) {
   EXPECT_EQ(run.output, "");
 }
 
-TEST_F(RunTest, AMarkMayStandBeforeTheCommand) {
+TEST_F(RunTest, ASeparatorMayPrecedeTheCommand) {
   EXPECT_EQ(Run({"--", "echo", "--", "a"}).output, "-- a\n");
   EXPECT_EQ(Run({"--timeout", "5", "--", "sh", "-c", "echo b"}).output, "b\n");
   EXPECT_EQ(Run({"echo", "--", "c"}).output, "-- c\n");
@@ -53,7 +53,7 @@ TEST_F(RunTest, AMarkMayStandBeforeTheCommand) {
   EXPECT_EQ(Run({"echo", "command:", "", "--x="}).output, "command:  --x=\n");
 }
 
-TEST_F(RunTest, WhatFollowsTheMarkIsTheCommandWhateverItLooksLike) {
+TEST_F(RunTest, EverythingAfterTheSeparatorIsTheCommand) {
   for (std::string const program : {"-x", "--timeout", "--help", "--", "--x="}) {
     TRun const run = Run({"--", program, "--help"});
     EXPECT_EQ(run.status, 1);
@@ -61,7 +61,7 @@ TEST_F(RunTest, WhatFollowsTheMarkIsTheCommandWhateverItLooksLike) {
   }
 }
 
-TEST_F(RunTest, TellsThatACommandFailed) {
+TEST_F(RunTest, ReportsThatACommandFailed) {
   std::string const reason = " could not be executed, did not exit with 0 or was ended by a signal\n";
   for (std::vector<std::string> const& command :
        {std::vector<std::string>{"sh", "-c", "echo said; exit 3"}, {"sh", "-c", "echo said; kill -9 $$"}}) {
@@ -76,7 +76,7 @@ TEST_F(RunTest, TellsThatACommandFailed) {
   EXPECT_EQ(run.errors, "zep: /nonexistent does not exist\n");
 }
 
-// The system hands the choice on to zep, and would take the children's results.
+// zep inherits the setting, with which the system discards the exit status of children.
 TEST_F(RunTest, ACallerThatIgnoresItsChildrenMakesNoDifference) {
   TCall call = {{"run", "echo", "done"}};
   call.ignoresChildren = true;
@@ -102,7 +102,7 @@ private:
   sigset_t fBefore{};
 };
 
-TEST_F(RunTest, ACallerThatBlocksSignalsDoesNotKeepItFromEnding) {
+TEST_F(RunTest, ACallerThatBlocksSignalsDoesNotKeepZepFromEnding) {
   TBlockedSignals const blocked;
   for (int const signal : {SIGTERM, SIGINT, SIGHUP}) {
     TCall call = {{"run", "--timeout", "20", "sh", "-c", "kill -" + std::to_string(signal) + " $PPID; exec sleep 1"}};
@@ -110,7 +110,7 @@ TEST_F(RunTest, ACallerThatBlocksSignalsDoesNotKeepItFromEnding) {
   }
 }
 
-TEST_F(RunTest, TheTimeoutIsOneOfSilence) {
+TEST_F(RunTest, TheTimeoutLimitsSilence) {
   EXPECT_EQ(Run({"--timeout", "3", "sh", "-c", "sleep 1; echo a; sleep 1; echo b; sleep 1; echo c; sleep 1"}).output,
             "a\nb\nc\n");
   auto const start = std::chrono::steady_clock::now();
@@ -123,7 +123,7 @@ TEST_F(RunTest, TheTimeoutIsOneOfSilence) {
   EXPECT_EQ(::kill(std::stoi(run.output), SIGKILL), 0) << "the command should still run";
 }
 
-TEST_F(RunTest, WithoutACommandOrWithAnOddTimeoutItIsWrongUsage) {
+TEST_F(RunTest, AMissingCommandOrAnInvalidTimeoutIsWrongUsage) {
   TRun const run = Run({});
   EXPECT_EQ(run.status, 64);
   EXPECT_EQ(run.errors, "zep: there is no command to run\n");

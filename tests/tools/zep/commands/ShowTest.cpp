@@ -30,7 +30,7 @@ protected:
   TInstallation fZep;
 };
 
-TEST_F(ShowTest, EveryPathThatOneRunPrintsAnotherOneShows) {
+TEST_F(ShowTest, EveryPathInAReportIsShown) {
   auto const instances = JsonOf(Run({"report", "--json"}))["instances"];
   EXPECT_EQ(instances.size(), 20u);
   for (auto const& instance : instances) {
@@ -41,7 +41,7 @@ TEST_F(ShowTest, EveryPathThatOneRunPrintsAnotherOneShows) {
   }
 }
 
-TEST_F(ShowTest, EveryPathIsOfOneObjectAndShowsIt) {
+TEST_F(ShowTest, EveryPathNamesOneObject) {
   auto const instances = JsonOf(Run({"report", "--json"}, "hard-to-name"))["instances"];
   std::set<std::string> paths;
   for (auto const& instance : instances) {
@@ -58,7 +58,7 @@ TEST_F(ShowTest, EveryPathIsOfOneObjectAndShowsIt) {
     EXPECT_THAT(paths, testing::Contains(path));
 }
 
-TEST_F(ShowTest, EveryPathInAListOfInstancesShowsIt) {
+TEST_F(ShowTest, EveryPathInAListOfInstancesIsShown) {
   for (std::string const name : {"X_Note", "X_LateNote", "X_Plain", "X_Bytes", "X_ToBytes"}) {
     std::string const text = Run({"show", name}, "hard-to-name").output;
     auto const lines = LinesOf(text.substr(text.find("\nInstances\n") + 11));
@@ -69,7 +69,7 @@ TEST_F(ShowTest, EveryPathInAListOfInstancesShowsIt) {
   }
 }
 
-TEST_F(ShowTest, AnInstanceWithoutKeysHasANumberAndItsClassTheName) {
+TEST_F(ShowTest, AnInstanceWithoutKeysHasANumber) {
   EXPECT_THAT(Run({"show", "X_Note#2"}, "hard-to-name").output,
               testing::AllOf(testing::StartsWith("root/test:X_Note#2\n\n"), HasSubstr("second\n")));
   EXPECT_THAT(Run({"show", "X_Note"}, "hard-to-name").output,
@@ -106,12 +106,12 @@ TEST_F(ShowTest, AnObjectIsShownWithTypesAndValues) {
             "NumberOfPowerCords        uint16      2\n");
 }
 
-TEST_F(ShowTest, APathWithoutNamespaceIsLookedForInAll) {
+TEST_F(ShowTest, APathWithoutNamespaceIsSearchedInAllNamespaces) {
   EXPECT_EQ(Run({"show", "CIM_Chassis.CreationClassName=\"CIM_Chassis\",Tag=\"Chassis 0\""}).status, 0);
   EXPECT_EQ(Run({"show", "X_Link.Id=\"1\""}).status, 0);
 }
 
-TEST_F(ShowTest, AMissingValueSaysWhy) {
+TEST_F(ShowTest, AMissingValueHasAReason) {
   TRun const run = Run({"show",
                         "CIM_Processor.CreationClassName=\"CIM_Processor\",DeviceID=\"Processor 0\","
                         "SystemCreationClassName=\"QRVSG_ComputerSystem\",SystemName=\"db1\""});
@@ -137,7 +137,7 @@ TEST_F(ShowTest, AClassIsShownWithInheritedPropertiesAndItsInstances) {
   EXPECT_EQ(object["instances"].size(), 1u);
 }
 
-TEST_F(ShowTest, AClassWithoutInstancesSaysWhy) {
+TEST_F(ShowTest, AClassWithoutInstancesHasAReason) {
   TCall call;
   call.arguments = {"show", "CIM_Chassis"};
   call.environment = {{"ZEP_SMBIOS_TABLE", fZep.Path("nothing")}};
@@ -151,7 +151,7 @@ TEST_F(ShowTest, AReferenceIsShownAsItsPath) {
   EXPECT_EQ(object["properties"]["Target"]["value"], "X_Odd.Id=\"quote \\\" and \\\\ and \x1b[31m\"");
 }
 
-TEST_F(ShowTest, WhatIsNotThereIsAnError) {
+TEST_F(ShowTest, AMissingObjectIsAnError) {
   for (std::string const path :
        {"CIM_Nothing", "root/zep/host:CIM_Nothing", "root/other:CIM_Chassis", "CIM_Chassis.Tag=\"Chassis 7\"",
         "CIM_Chassis.Nothing=\"1\"", "CIM_Chassis.Tag=", ":", "root/zep/host:", "\"", "CIM_Chassis.Tag=\"a"}) {
@@ -198,7 +198,7 @@ TEST_F(ShowTest, ClassesNamesANamespaceThatFailsAndShowsTheOthers) {
   EXPECT_EQ(JsonOf(run)["namespaces"].size(), 1u);
 }
 
-TEST_F(ShowTest, WhatIsNotThereIsADocumentToo) {
+TEST_F(ShowTest, AMissingObjectHasADocument) {
   TRun const run = Run({"show", "X_None", "--json"});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: no provider has the object \"X_None\"\n");

@@ -49,7 +49,7 @@ TEST(JsonTest, TypesHaveTheirNames) {
   EXPECT_EQ(NameOf(TCIMValue().GetType()), "none");
 }
 
-TEST(JsonTest, BytesThatAreNoUtf8AreReplaced) { EXPECT_EQ(AsText(TJson("\xff-\xc3\xa9")), "\"\xef\xbf\xbd-\xc3\xa9\"\n"); }
+TEST(JsonTest, BytesThatAreNotUtf8AreReplaced) { EXPECT_EQ(AsText(TJson("\xff-\xc3\xa9")), "\"\xef\xbf\xbd-\xc3\xa9\"\n"); }
 
 }  // namespace
 }  // namespace NQRVZEP20::zep

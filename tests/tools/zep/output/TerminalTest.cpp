@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// What zep prints at a terminal: as wide as that is, and in plain lines at a dumb one.
+// The output of zep on a terminal: as wide as the terminal, and in plain lines on a dumb one.
 
 #include "tools/zep/output/Terminal.h"
 
@@ -26,7 +26,7 @@ TEST(TerminalTest, ColumnsAreANumberThatATerminalCanHave) {
 
 class AtTerminalTest : public testing::Test {
 protected:
-  // What zep shows at a terminal of that many columns, without the carriage returns of the line ends.
+  // The output of zep on a terminal of that many columns, without the carriage returns of the line ends.
   std::string Shown(std::vector<std::string> const& arguments, unsigned short columns,
                     std::map<std::string, std::string> const& environment = {}) {
     winsize size{};
@@ -78,7 +78,7 @@ TEST_F(AtTerminalTest, ATableIsAsWideAsTheTerminal) {
   EXPECT_THAT(Shown(call, 60), HasSubstr("PropertyWithAName "));
 }
 
-TEST_F(AtTerminalTest, ColumnsCountsBeforeTheSystem) {
+TEST_F(AtTerminalTest, ColumnsOverridesTheSystem) {
   WriteFile(fZep.Path("a.mof"), "class X_A { string PropertyWithAName = \"" + kWords + "\"; };\n");
   std::vector<std::string> const call = {"show", "X_A", "--mof", fZep.Path("a.mof")};
   EXPECT_THAT(Shown(call, 80, {{"COLUMNS", "160"}}), HasSubstr(kWords));
@@ -113,7 +113,7 @@ TEST_F(AtTerminalTest, AListOfHostsShowsItsProgressInPlainLines) {
   EXPECT_EQ(dumb.find('\r'), std::string::npos);
 }
 
-TEST_F(AtTerminalTest, HelpIsACommandToo) {
+TEST_F(AtTerminalTest, HelpIsAlsoACommand) {
   EXPECT_EQ(fZep.Run({{"help"}}).output, fZep.Run({{"--help"}}).output);
   EXPECT_EQ(fZep.Run({{"help", "report"}}).output, fZep.Run({{"report", "--help"}}).output);
   EXPECT_EQ(fZep.Run({{"help", "media", "mount"}}).output, fZep.Run({{"media", "mount", "--help"}}).output);

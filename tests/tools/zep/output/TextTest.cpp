@@ -51,7 +51,7 @@ TEST(TextTest, AColumnIsAsWideAsItsLongestWord) {
   EXPECT_EQ(table.GetText(), "Name" + blanks + "  Value     By\nConfiguredMemoryClockSpeed  v         x\n");
 }
 
-TEST(TextTest, ColumnsGiveWhatTheyDoNotNeed) {
+TEST(TextTest, ColumnsGiveUpUnneededWidth) {
   TTable table({4, 20});
   table.Add({"1234567890", "one two three four"});
   EXPECT_EQ(table.TextFor(ELayout::kFile, 26), "1234567890  one two three\n            four\n");
@@ -69,7 +69,7 @@ TEST(TextTest, AWordThatTakesMostOfTheLineIsCut) {
             "      12345\n");
 }
 
-TEST(TextTest, ATerminalGivesWideColumnsWhatItHas) {
+TEST(TextTest, WideColumnsFillTheTerminal) {
   TTable table({6, 8});
   table.Add({"one two", "three four five six"});
   EXPECT_EQ(table.TextFor(ELayout::kFile, 80), "one     three\ntwo     four\n        five six\n");
