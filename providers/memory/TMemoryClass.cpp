@@ -220,8 +220,8 @@ void TMemoryClass::DeclareIn(TMemoryLayout& layout) const {
     layout.fDecls.Put(decl);
     if (!decl->IsMarked("Key")) continue;
     std::size_t const position = layout.fDecls.PositionOf(decl->Name());
-    auto const place = std::lower_bound(layout.fKeys.begin(), layout.fKeys.end(), position);
-    if (place == layout.fKeys.end() || *place != position) layout.fKeys.insert(place, position);
+    auto const at = std::lower_bound(layout.fKeys.begin(), layout.fKeys.end(), position);
+    if (at == layout.fKeys.end() || *at != position) layout.fKeys.insert(at, position);
   }
 }
 

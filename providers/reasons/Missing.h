@@ -15,7 +15,7 @@ struct TMissing {
 constexpr char const* kMissingNoTables = "no-smbios";          // the system exports no SMBIOS tables
 constexpr char const* kMissingNeedsRoot = "needs-root";        // only root may read the source
 constexpr char const* kMissingUnreadable = "unreadable";       // the source cannot be read for another reason
-constexpr char const* kMissingPlaceholder = "placeholder";     // the source contains a text that stands for no value
+constexpr char const* kMissingPlaceholder = "placeholder";     // the source contains a placeholder text instead of a value
 constexpr char const* kMissingNotGiven = "not-given";          // the source omits the value or calls it unknown
 constexpr char const* kMissingUnexpected = "unexpected-form";  // the source contains something that is not such a value
 

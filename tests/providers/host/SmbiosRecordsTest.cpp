@@ -302,7 +302,7 @@ TEST(ProcessorRecordTest, FieldsThatAreUnknownToTheFirmwareAreNull) {
 
 TEST(ProcessorRecordTest, NarrowFieldsMayReferToWideFields) {
   struct TRow {
-    char const* what;
+    char const* description;
     TStructureMaker maker;
     char const *property, *value;
   } const rows[] = {
@@ -315,7 +315,7 @@ TEST(ProcessorRecordTest, NarrowFieldsMayReferToWideFields) {
       {"the last socket of CIM", Processor().Byte(0x19, 56), "UpgradeMethod", "uint16 56"},
       {"a 32-bit processor", Processor().Word(0x26, 0x0008), "DataWidth", "uint16 32"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(PropertyOf(ProcessorRecordOf(row.maker), row.property), row.value) << row.what;
+  for (TRow const& row : rows) EXPECT_EQ(PropertyOf(ProcessorRecordOf(row.maker), row.property), row.value) << row.description;
 }
 
 TEST(ProcessorRecordTest, FieldsOfNewerVersionsAreMissingInOldStructures) {
@@ -336,7 +336,7 @@ TEST(ProcessorRecordTest, ARoleOutOfRangeIsUnexpected) {
 TEST(ProcessorRecordTest, EmptySocketsAreRecognised) {
   EXPECT_TRUE(IsSocketFilled(Processor().Byte(0x18, 0x41).Make()));
   EXPECT_FALSE(IsSocketFilled(Processor().Byte(0x18, 0x00).Make()));
-  EXPECT_TRUE(IsSocketFilled(TStructureMaker(4, 0x10).Make())) << "says nothing of it";
+  EXPECT_TRUE(IsSocketFilled(TStructureMaker(4, 0x10).Make())) << "without that field";
 }
 
 // ---- Memory ----
@@ -386,7 +386,7 @@ TEST(MemoryRecordTest, EveryFieldIsReadAtItsOffset) {
 
 TEST(MemoryRecordTest, CapacityIsConvertedToBytes) {
   struct TRow {
-    char const* what;
+    char const* description;
     TStructureMaker maker;
     std::string value;
   } const rows[] = {
@@ -399,12 +399,12 @@ TEST(MemoryRecordTest, CapacityIsConvertedToBytes) {
       {"extended, but the structure is short", TStructureMaker(17, 0x1c).Word(0x0c, 0x7fff), kTooShort},
       {"no field at all", TStructureMaker(17, 0x0c), kTooShort},
   };
-  for (TRow const& row : rows) EXPECT_EQ(ModuleProperty(row.maker, "Capacity"), "uint64 " + row.value) << row.what;
+  for (TRow const& row : rows) EXPECT_EQ(ModuleProperty(row.maker, "Capacity"), "uint64 " + row.value) << row.description;
 }
 
 TEST(MemoryRecordTest, GreatSpeedsAreReadFromTheExtendedField) {
   struct TRow {
-    char const* what;
+    char const* description;
     TStructureMaker maker;
     std::string speed, configured;
   } const rows[] = {
@@ -417,7 +417,7 @@ TEST(MemoryRecordTest, GreatSpeedsAreReadFromTheExtendedField) {
        kTooShort},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
+    SCOPED_TRACE(row.description);
     EXPECT_EQ(ModuleProperty(row.maker, "MaxMemorySpeed"), "uint32 " + row.speed);
     EXPECT_EQ(ModuleProperty(row.maker, "ConfiguredMemoryClockSpeed"), "uint32 " + row.configured);
     bool const isKnown = row.speed.find("NULL") == std::string::npos;

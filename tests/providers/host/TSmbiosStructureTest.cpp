@@ -45,7 +45,7 @@ TEST(TSmbiosStructureTest, FieldsAfterTheFormattedAreaAreMissing) {
 
 TEST(TSmbiosStructureTest, NothingOutsideTheBytesIsRead) {
   struct TRow {
-    char const* what;
+    char const* description;
     std::string bytes;
   } const rows[] = {
       {"nothing at all", ""},
@@ -55,7 +55,7 @@ TEST(TSmbiosStructureTest, NothingOutsideTheBytesIsRead) {
       {"a length below that of the header", "\x01\0\0\0\1\1\0\0"s},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
+    SCOPED_TRACE(row.description);
     TSmbiosStructure const structure = StructureOf(row.bytes);
     EXPECT_EQ(ResultOf(structure.Byte(0x07)), kTooShort);
     EXPECT_EQ(ResultOf(structure.DWord(0x17)), kTooShort);
@@ -74,7 +74,7 @@ TEST(TSmbiosStructureTest, StringsAreCountedFromOne) {
 
 TEST(TSmbiosStructureTest, AStringThatTheStructureDoesNotContainIsMissing) {
   struct TRow {
-    char const* what;
+    char const* description;
     std::string strings;
     bool isPresent;
   } const rows[] = {
@@ -86,7 +86,7 @@ TEST(TSmbiosStructureTest, AStringThatTheStructureDoesNotContainIsMissing) {
       {"an empty text ends the set", "first\0\0second\0\0"s, false},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
+    SCOPED_TRACE(row.description);
     TSmbiosStructure const structure = StructureOf("\x01\x05\0\0\2"s + row.strings);
     EXPECT_EQ(
         ResultOf(structure.Text(4)),

@@ -246,14 +246,14 @@ TEST_F(TMemoryClassInstanceTest, OnlyInstancesOfTheClassItselfAreCommitted) {
   auto const other = NewNamespace();
   other->DefineClass("X_Disk").Key("Id", "uint32");
   struct {
-    char const* what;
+    char const* description;
     boost::shared_ptr<ICIMInstance> instance;
   } const rows[] = {{"none", nullptr},
                     {"of the superclass", Make(*fDevice, 1)},
                     {"of a subclass", Make(*fSsd, 1)},
                     {"of another namespace", Make(*other->GetClass("X_Disk", kNone), 1)}};
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.what);
+    SCOPED_TRACE(row.description);
     EXPECT_STATUS(fDisk->CommitInstance(row.instance, kNone), kZEPStatusInvalidInstance);
   }
   EXPECT_THAT(InstancePaths(*fDevice), IsEmpty());

@@ -54,9 +54,9 @@ protected:
     try {
       ReadMofFile(fDir.Path("schema/all.mof"), ns);
     } catch (TMofError const& error) {
-      std::string what = error.what();
-      EXPECT_THAT(what, StartsWith(fDir.Path("schema/")));
-      return what.substr(fDir.Path("schema/").size());
+      std::string message = error.what();
+      EXPECT_THAT(message, StartsWith(fDir.Path("schema/")));
+      return message.substr(fDir.Path("schema/").size());
     }
     std::string names;
     for (std::string const& name : ClassNames(*ns)) names += name + " ";
