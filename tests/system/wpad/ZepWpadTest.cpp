@@ -314,11 +314,11 @@ TEST_F(ZepWpadTest, WrongUsage) {
   }
 }
 
-TEST_F(ZepWpadTest, HelpTellsOfTheDhcpClientsAndTheExitStatus) {
+TEST_F(ZepWpadTest, HelpDescribesTheDhcpClientsAndTheExitStatus) {
   TRun const run = Zep("", "$ZEP wpad --help");
   EXPECT_EQ(run.status, 0);
   EXPECT_NE(run.output.find("the running DHCP clients are ended first"), std::string::npos);
-  EXPECT_NE(run.output.find("Exit status: 0 when there is an address"), std::string::npos);
+  EXPECT_NE(run.output.find("Exit status: 0 when there is a URL"), std::string::npos);
 }
 
 }  // namespace
