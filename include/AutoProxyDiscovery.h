@@ -6,79 +6,81 @@
 #include <cstdint>
 #include <string>
 
-// Finds the web proxy: asks the DHCP server of the local network for the address of the proxy configuration file (Web Proxy
+// Finds the web proxy: queries the DHCP server of the local network for the URL of the proxy configuration file (Web Proxy
 // Auto-Discovery, DHCP option 252) with a DHCPINFORM message.
 //
-// At global scope, as callers name it. Static operations only; each runs on the caller's thread, blocks until done and
-// throws nothing. What fails is in the log at debug severity. Addresses of 32 bits are in network byte order, as they go
-// into the message. Only root may listen on the port of DHCP clients, and only one program of a machine.
+// The class is at global scope. Static operations only; each runs on the caller's thread, blocks until done and throws
+// nothing. Failures are logged at debug severity. 32-bit addresses are in network byte order, as in the message. Only root
+// may open the port of DHCP clients (68), and only one program of the machine at a time.
 class ZEP_EXPORT AutoProxyDiscovery {
 public:
-  static constexpr long kMessageSize = 1472;   // of the message sent, whole, and the most that is taken of a reply
-  static constexpr long kOptionsOffset = 240;  // where the options begin in a message
+  static constexpr long kMessageSize = 1472;   // bytes of the message sent, and the most bytes read of a reply
+  static constexpr long kOptionsOffset = 240;  // the offset of the options in a message
   static constexpr long kOptionsSize = kMessageSize - kOptionsOffset;
 
-  // The whole discovery: returns what the DHCP server names, usually the URL of a proxy configuration file, which is not
-  // fetched; empty when nobody does.
+  // Runs the complete discovery. Returns the value of option 252, usually the URL of a proxy configuration file, or an empty
+  // text when no reply contains one. The file is not fetched.
   //
-  // Ends the DHCP clients first (wpadPreconfig). Then asks for each interface whose name begins with "eth", with its IPv4
-  // address; a reply with a URL ends the discovery, one without it only the asking for that interface. In the end asks once
-  // more, for the first IPv6 address that the command "ifconfig" shows behind "inet6 addr: " and with the hardware address
-  // read last; an "ifconfig" of another format, as that of net-tools 2, shows none, and nothing is asked.
+  // First it ends the DHCP clients (wpadPreconfig). Then it sends a query for each interface whose name begins with "eth",
+  // with the IPv4 address of the interface. A reply with a URL ends the discovery; a reply without one ends only the query
+  // for that interface. If no reply contains a URL, one more query follows: its address is the first IPv6 address that the
+  // command "ifconfig" prints after "inet6 addr: ", and its hardware address is the one that was read last. This query is
+  // skipped when "ifconfig" prints no such address, as with the format of net-tools 2.
   //
-  // An asking that no reply ends takes 18 seconds: three times six. All messages leave by the route to 255.255.255.255,
-  // whichever interface they are about.
+  // An unanswered query takes 18 seconds: three attempts of six. All messages take the route to 255.255.255.255, whichever
+  // interface they describe.
   static std::string StartWpad();
 
   // ---- The steps ----
 
-  // Ends, by the command "kill", every process whose line in the output of "ps -e" holds "dhclient". What the command says
-  // lands in a file /dev/nul; where that cannot be made, as without root's rights, nothing is ended.
+  // Ends, with the command "kill", every process whose line in the output of "ps -e" contains "dhclient". The output of
+  // "kill" goes to a file /dev/nul; when that file cannot be created, as without root, no process is ended. Kept.
   //
-  // The lines are taken as they are. A "ps" that prints a name with a line break as two lines, as BusyBox does, lets any user
-  // make a line with any number, and root then ends that process. A caller with root's rights looks first whether the number
-  // before each such line is that of a process whose /proc/PID/comm holds "dhclient" (docs/security.md).
+  // The lines are not checked. The "ps" of BusyBox prints a process name with a line break as two lines, so any user can
+  // produce a line with any number, and root then ends that process. A caller that runs as root should first check each such
+  // line: the number at its beginning must be that of a process whose /proc/PID/comm contains "dhclient" (docs/security.md).
   static void wpadPreconfig();
 
-  // The DHCPINFORM message about an interface with that address (IPv4 or IPv6) and hardware address, kMessageSize bytes made
-  // by xzalloc. The message is returned and also put into the last argument (if not null); the caller frees it with free().
-  // What cannot be read of the texts stays 0 in the message. Null, in both places, without memory.
+  // Makes the DHCPINFORM message for an interface with that address (IPv4 or IPv6) and hardware address: kMessageSize bytes,
+  // which the caller frees with free(). The message is returned and also stored through the last argument, unless that is
+  // null; both are null when there is no memory. The field of an unreadable address is 0.
   static unsigned char* make_message(std::string const& address, std::string const& hardwareAddress, unsigned char*& message);
   static unsigned char* make_message(std::string const& address, std::string const& hardwareAddress,
                                      unsigned char** message = nullptr);
 
-  // The address for the message. A text with a colon is taken for IPv6.
+  // The address field of the message. A text with a colon is read as IPv6 (GetIPV6Ciaddr), any other as IPv4 (GetIPV4Ciaddr).
   static std::uint32_t GetCiaddr(std::string const& address);
 
-  // A dotted quad. 0 for any other text.
+  // Reads a dotted quad. Any other text gives 0.
   static std::uint32_t GetIPV4Ciaddr(std::string const& address);
 
-  // The IPv4 address within an IPv4-mapped one ("::ffff:10.0.0.2"). Any other IPv6 address has no place in the message: 0,
-  // which tells the server to answer to the address that the message came from. 0 also for a text that is no address.
+  // Reads the IPv4 address in an IPv4-mapped IPv6 address ("::ffff:10.0.0.2"). Any other IPv6 address does not fit into the
+  // message and gives 0: the server then answers to the address that the message came from. A text that is not an IPv6
+  // address gives 0, too.
   static std::uint32_t GetIPV6Ciaddr(std::string const& address);
 
-  // Reads six pairs of hexadecimal digits with colons between them into six bytes. Any other text leaves them as they are.
+  // Reads six pairs of hexadecimal digits, separated by colons, into six bytes. Any other text leaves the bytes unchanged.
   static void GetChaddr(std::string const& hardwareAddress, unsigned char* bytes);
 
-  // A UDP socket that may broadcast, for the caller to close; -1 when there is none.
+  // Returns a UDP socket that may broadcast, which the caller closes, or -1 on failure.
   static int open_send_socket();
 
-  // A UDP socket bound to port 68 of every address, for the caller to close; -1 when there is none. While the port is taken
-  // it tries again every 3 seconds, 11 times in all, and at last returns the socket without a port. The argument, the name
-  // of an interface, is not used.
+  // Returns a UDP socket that is bound to port 68 of every address, which the caller closes, or -1 when no socket can be
+  // created. If the port cannot be bound, tries again every 3 seconds. After 11 failed attempts it returns the socket without
+  // a port. Kept. The argument, the name of an interface, is not used.
   static int open_recv_socket(char* interfaceName);
 
-  // Sends that many bytes to 255.255.255.255, port 67. Returns how many were sent; -1, with errno, when that failed.
+  // Sends `size` bytes to 255.255.255.255, port 67. Returns the number of bytes sent, or -1 with errno set.
   static long send_packet(int socket, unsigned char const* bytes, long size);
 
-  // How long a receive on that socket waits. Returns 0; -1, with errno, when that failed.
+  // Sets the longest time that a receive on the socket waits. Returns 0, or -1 with errno set.
   static int readable_timeo(int socket, int seconds);
 
-  // The value of the first option 252 in an options area of kOptionsSize bytes; empty when there is none, when its length is
-  // 0, or when the area ends before it does. Reads no byte behind the area. Code 0 is an option like any other, with a
-  // length.
+  // Returns the value of the first option 252 in an options area of kOptionsSize bytes. It is empty when there is no such
+  // option, when its length is 0, or when its value does not end within the area. Reads no byte after the area. A pad (code
+  // 0) is read as if a length followed it. Kept.
   static std::string dhcp_parser(unsigned char* options);
 
-  // Zero-filled memory, for the caller to free with free(). Null when there is none.
+  // Returns zero-filled memory, which the caller frees with free(), or null when there is none.
   static void* xzalloc(unsigned long size);
 };

@@ -12,19 +12,19 @@ class ICIMProperty;
 class ICIMPropertyDecl;
 
 // A CIM class: its name, superclass, qualifiers, property and method declarations, and its instances. Some operations have a
-// default body, so that a plug-in may leave them out; unless its comment says otherwise, that body logs an error and throws
-// kZEPStatusNotImplemented. ICIMElement.h lists what the destination of a copy needs.
+// default body, so that a plug-in may leave them out. Unless the comment says otherwise, the default body logs an error and
+// throws kZEPStatusNotImplemented. ICIMElement.h lists the operations that each use needs.
 class ZEP_EXPORT ICIMClass : public ICIMNamedElement {
 public:
   ~ICIMClass() override;
 
   virtual boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) const = 0;
 
-  // True for an association: the class or one of its superclasses carries the qualifier Association. A namespace copy
-  // creates associations in a second pass, when every class that they refer to already exists.
+  // True for an association: the class or one of its superclasses carries the qualifier Association. A namespace copy creates
+  // associations in a second pass, after every class that they refer to.
   virtual bool GetClassFlag(TCIMContext const& context) const = 0;
 
-  // True when this class itself carries the qualifier Abstract and so can have no instances of its own. Has a default body,
+  // True when this class itself carries the qualifier Abstract: it cannot have instances of its own. Has a default body,
   // which returns false.
   virtual bool IsAbstract(TCIMContext const& context) const;
 
@@ -38,16 +38,16 @@ public:
 
   // ---- Declaring ----
 
-  // Between these two calls the class is still being described: GetPropertyDecl then returns an empty pointer, instead of
-  // throwing, for a name that is not declared yet. The calls do not nest; EndDeclarations without BeginDeclarations does
-  // nothing. Both have a default body, which does nothing.
+  // Between these two calls the caller declares the elements of the class. GetPropertyDecl then returns an empty pointer for
+  // a name that is not declared yet, instead of throwing. The calls do not nest; EndDeclarations without BeginDeclarations
+  // does nothing. Both have a default body, which does nothing.
   virtual void BeginDeclarations(TCIMContext const& context);
   virtual void EndDeclarations(TCIMContext const& context);
 
-  // Declares a property. `defaultValue` determines its type, array bound and referenced class; a NULL value of the right
-  // type means that the property has no default. Throws kZEPStatusAlreadyExists when this class itself declares the name,
-  // kZEPStatusTypeMismatch for a default of tag 0, and kZEPStatusInvalidOpSequence once CreateInstance of the class or of a
-  // subclass has been called.
+  // Declares a property. `defaultValue` determines its type, array bound and referenced class; a NULL `defaultValue` of the
+  // intended type means that the property has no default. Throws kZEPStatusAlreadyExists when this class itself declares the
+  // name, kZEPStatusTypeMismatch when `defaultValue` has the tag 0, and kZEPStatusInvalidOpSequence after CreateInstance of
+  // the class or of a subclass has been called.
   virtual boost::shared_ptr<ICIMPropertyDecl> AddPropertyDecl(std::string const& name, TCIMValue const& defaultValue,
                                                               TCIMContext const& context) = 0;
 
@@ -62,7 +62,7 @@ public:
 
   // ---- Static properties: values that belong to the class ----
 
-  // Sets the value that this class itself holds for a property that it declares or inherits; an earlier value is replaced.
+  // Sets the static value of a property that this class declares or inherits, for this class only; replaces an earlier value.
   // Throws kZEPStatusNotFound for a name that is not declared and kZEPStatusTypeMismatch for a value of another type. Has a
   // default body.
   virtual void SetStaticProperty(std::string const& name, TCIMValue const& value, TCIMContext const& context);
@@ -73,8 +73,8 @@ public:
 
   // ---- Instances ----
 
-  // A new instance with every property at its default. Until CommitInstance it belongs to the caller alone. Throws
-  // kZEPStatusInvalidClass for an abstract class.
+  // Creates an instance whose properties have their defaults. Until CommitInstance, only the caller holds it, and
+  // enumerations do not visit it. Throws kZEPStatusInvalidClass for an abstract class.
   virtual boost::shared_ptr<ICIMInstance> CreateInstance(TCIMContext const& context) = 0;
 
   // Visits the instances of this class and then those of its subclasses, class by class in the order of EnumerateSubClasses,

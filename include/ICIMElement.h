@@ -12,36 +12,37 @@
 
 namespace NQRVZEP20 {
 
-// What an object path can name: a class or an instance. The root of the object model interfaces.
+// An element that an object path can name: a class or an instance. The base class of ICIMInstance and ICIMNamedElement.
 //
-// The object model belongs to plug-ins: the library reaches classes, instances and qualifiers only through these
-// interfaces and stores none of its own. For all of them:
+// The object model belongs to plug-ins: the library uses classes, instances and qualifiers only through these interfaces and
+// stores none of its own. These rules apply to all of the interfaces:
 //
-// - Objects are passed and held as boost::shared_ptr. A back-pointer, from an element to its namespace or owner, is a
-//   boost::weak_ptr; locking one whose target is gone throws boost::bad_weak_ptr.
-// - The last argument of every operation is a context: named values that a caller carries to the plug-in. Pass an empty
-//   TCIMContext() unless there is something to carry. A plug-in that knows nothing of an entry ignores it.
-// - An enumeration calls back once per element and stops at the first call that returns false. TAddToVectorCallback
-//   collects everything. The callback may look elements up, but must not add to what is being enumerated.
-// - Failure is a thrown TZEPException. A class or property declaration that is not there is kZEPStatusNotFound; anything
-//   else that is not there (a qualifier declaration, a qualifier, a property, an instance) comes back as an empty pointer,
-//   which the caller tests before use.
-// - An operation that only some uses need has a body, so that a plug-in which is not used in that way need not write it.
-//   Unless its comment says otherwise, the body logs one error that names the plug-in's class and the operation, and throws
-//   kZEPStatusNotImplemented. Which of them a use needs:
+// - Objects are passed and held as boost::shared_ptr. A pointer from an element to its namespace or owner is a
+//   boost::weak_ptr; making a boost::shared_ptr from one whose target has been destroyed throws boost::bad_weak_ptr.
+// - The last argument of every operation is a context: named values that the caller passes to the plug-in, usually none
+//   (TCIMContext()). A plug-in ignores the entries that it does not know.
+// - An enumeration calls the callback once per element and stops at the first call that returns false. TAddToVectorCallback
+//   collects all elements. The callback may look elements up, but must not add elements of the kind that is being enumerated.
+// - A failing operation throws TZEPException. A lookup of a missing class or property declaration throws kZEPStatusNotFound.
+//   A lookup of any other missing element (a qualifier declaration, a qualifier, a property, an instance) returns an empty
+//   pointer, which the caller must check.
+// - An operation that only some uses need has a default body, so that other plug-ins need not implement it. Unless its
+//   comment says otherwise, the default body logs one error that names the plug-in's class and the operation, and throws
+//   kZEPStatusNotImplemented. These uses need operations that have such a body:
 //
-//     a copy's source (TCIMCopy)    GetDeclaration of a property, when a class has static properties; GetClass of an instance
-//                                   and GetName of a property, when instances are copied
-//     a copy's destination          CreateQualifierDecl, AddQualifier, SetStaticProperty and AddMethodDecl, when the source
-//                                   has such; CommitInstance, when instances are copied
+//     source of a copy (TCIMCopy)   ICIMProperty::GetDeclaration, if a class has static properties; ICIMInstance::GetClass and
+//                                   ICIMProperty::GetName, if instances are copied
+//     destination of a copy         CreateQualifierDecl, AddQualifier, SetStaticProperty and AddMethodDecl, if the source has
+//                                   such elements; CommitInstance, if instances are copied
 //     queries (TCIMSchemaHelper)    none
 //     references (TCIMReference)    none
-//     the tool zep                  GetName of a namespace, GetPath, GetName and GetDeclaration of a property, IsKey
+//     the tool zep                  ICIMNamespace::GetName, ICIMInstance::GetPath, ICIMProperty::GetName and GetDeclaration,
+//                                   ICIMPropertyDecl::IsKey
 //
-//   docs/writing-a-provider.md has the whole table, of the operations without a body too.
-// - Names are compared without regard to case, as CIM names are, and keep the spelling they were made with. What is
-//   created or declared under a name that is no CIM name throws kZEPStatusInvalidCIMName.
-// - Nothing is promised about threads: one namespace is used from one thread at a time.
+//   docs/writing-a-provider.md has the complete table, including the operations without a body.
+// - Names are compared without regard to case, as CIM names are, and keep the spelling with which they were created. Creating
+//   or declaring an element under a name that is not a CIM name throws kZEPStatusInvalidCIMName.
+// - Plug-ins need not synchronise: use a namespace and its elements from one thread at a time.
 class ZEP_EXPORT ICIMElement {
 public:
   virtual ~ICIMElement();

@@ -7,7 +7,7 @@ namespace NQRVZEP20 {
 
 class ICIMParameterDecl;
 
-// The declaration of a method in a class: a name, a return type and parameters. Methods are described, not called.
+// The declaration of a method in a class: a name, a return type and parameters. There is no operation that calls a method.
 class ZEP_EXPORT ICIMMethodDecl : public ICIMNamedElement {
 public:
   ~ICIMMethodDecl() override;
@@ -15,8 +15,8 @@ public:
   virtual TCIMValue::TCIMType GetReturnType(TCIMContext const& context) const = 0;  // never an array
 
   // Adds a parameter after the existing ones. `referencedClassName` must be empty unless the type is a reference or an array
-  // of references (otherwise throws kZEPStatusNotReference), and `maxArraySize` must be 0 unless it is an array (otherwise
-  // throws kZEPStatusNotArray). Throws kZEPStatusAlreadyExists when the method already has a parameter of that name, and
+  // of references, and `maxArraySize` must be 0 unless the type is an array. Otherwise throws kZEPStatusNotReference or
+  // kZEPStatusNotArray. Throws kZEPStatusAlreadyExists when the method already has a parameter of that name, and
   // kZEPStatusTypeMismatch for a type that has no name.
   virtual boost::shared_ptr<ICIMParameterDecl> AddParameterDecl(std::string const& name, TCIMValue::TCIMType type,
                                                                 unsigned int maxArraySize, std::string const& referencedClassName,

@@ -8,26 +8,28 @@ namespace NQRVZEP20 {
 
 class ICIMQualifier;
 
-// A schema element that has a name and may carry qualifiers: a class, property, method or parameter declaration. Wherever
-// these interfaces depend on whether an element carries a qualifier, one with the boolean value false counts as absent.
+// A schema element that has a name and may carry qualifiers: a class, property, method or parameter declaration. A qualifier
+// with the boolean value false counts as missing where a rule of these interfaces depends on it, such as Key, Abstract or
+// Association.
 class ZEP_EXPORT ICIMNamedElement : public ICIMElement {
 public:
   ~ICIMNamedElement() override;
 
   virtual std::string GetName(TCIMContext const& context) const = 0;
 
-  // The qualifier written on this element itself. Empty when there is none, even if a superclass has one.
+  // Returns the qualifier written on this element itself, or an empty pointer when there is none, even if the element of a
+  // superclass has one.
   virtual boost::shared_ptr<ICIMQualifier> GetQualifier(std::string const& name, TCIMContext const& context) const = 0;
 
   // Visits the qualifiers written on this element itself, in the order in which they were added.
   virtual void EnumerateQualifiers(boost::function<bool(boost::shared_ptr<ICIMQualifier>)> callback,
                                    TCIMContext const& context) const = 0;
 
-  // Writes a qualifier on this element. Throws kZEPStatusNotFound when `declaration` is empty or belongs to another
-  // namespace, kZEPStatusTypeMismatch when the value is not of the declared type, kZEPStatusAlreadyExists when the element
-  // already has the qualifier, and kZEPStatusInvalidOpSequence for Key on a property of a class that has already created
-  // instances. The scope of the declaration is not checked against the kind of element. Has a default body, which logs an
-  // error and throws kZEPStatusNotImplemented; the destination of a copy needs this operation.
+  // Adds a qualifier to this element. Throws kZEPStatusNotFound when `declaration` is empty or belongs to another namespace,
+  // kZEPStatusTypeMismatch when the value is not of the declared type, kZEPStatusAlreadyExists when the element already has
+  // the qualifier, and kZEPStatusInvalidOpSequence for Key on a property of a class that has already created instances. The
+  // scope of the declaration is not checked against the kind of element. Has a default body, which logs an error and throws
+  // kZEPStatusNotImplemented; the destination of a copy needs this operation.
   virtual boost::shared_ptr<ICIMQualifier> AddQualifier(boost::shared_ptr<ICIMQualifierDecl> declaration, TCIMValue const& value,
                                                         unsigned int flavor, TCIMContext const& context);
 };

@@ -7,7 +7,7 @@ namespace NQRVZEP20 {
 
 class ICIMPropertyDecl;
 
-// One property value: of an instance, or of a class itself (a static property).
+// The value of one property: of an instance, or of a class itself (a static property).
 class ZEP_EXPORT ICIMProperty {
 public:
   virtual ~ICIMProperty();
@@ -18,8 +18,8 @@ public:
   // kZEPStatusInvalidOpSequence for a key of an instance that has been committed.
   virtual void SetValue(TCIMValue const& value, TCIMContext const& context) = 0;
 
-  // Both have a default body, which logs an error and throws kZEPStatusNotImplemented. Copying an instance needs the first,
-  // copying a static property the second.
+  // Both have a default body, which logs an error and throws kZEPStatusNotImplemented. Copying an instance needs GetName,
+  // copying a static property needs GetDeclaration.
   virtual std::string GetName(TCIMContext const& context) const;  // spelled as declared
   virtual boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(TCIMContext const& context) const;
 };

@@ -5,8 +5,8 @@
 
 namespace NQRVZEP20 {
 
-// The declaration of a property in a class. Its type, array bound and referenced class are those of its default value. A
-// property without a default has a NULL default value, which carries all three.
+// The declaration of a property in a class. Its type, array bound and referenced class are those of its default value. If a
+// property has no default, its default value is a NULL with that type, array bound and referenced class.
 class ZEP_EXPORT ICIMPropertyDecl : public ICIMNamedElement {
 public:
   ~ICIMPropertyDecl() override;
@@ -14,7 +14,7 @@ public:
   virtual TCIMValue::TCIMType GetType(TCIMContext const& context) const = 0;
   virtual TCIMValue GetDefaultValue(TCIMContext const& context) const = 0;
 
-  // True when the property is a key: it carries the qualifier Key, or overrides a property that does. Has a default body,
+  // True when the property is a key: it carries the qualifier Key, or overrides a property that is a key. Has a default body,
   // which logs an error and throws kZEPStatusNotImplemented.
   virtual bool IsKey(TCIMContext const& context) const;
 

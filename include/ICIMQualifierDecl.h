@@ -5,7 +5,8 @@
 
 namespace NQRVZEP20 {
 
-// A qualifier declaration of a namespace. It fixes the type, scope, flavor and default value of the qualifiers of its name.
+// A qualifier declaration of a namespace. It determines the type, scope, flavor and default value of the qualifiers with its
+// name.
 class ZEP_EXPORT ICIMQualifierDecl {
 public:
   // The kinds of element that may carry the qualifier. Values are combined with |.
@@ -22,8 +23,8 @@ public:
 
   // How subclasses inherit the qualifier. Values are combined with |; 0 means restricted, with overriding disabled.
   enum EFlavor : unsigned int {
-    kFlavorEnableOverride = 0x01,  // a subclass may give it another value
-    kFlavorToSubclass = 0x02,      // subclasses inherit it; without this flag it is restricted to its own element
+    kFlavorEnableOverride = 0x01,  // a subclass may give the qualifier another value
+    kFlavorToSubclass = 0x02,      // subclasses inherit it; without this flag it applies to its own element only
     kFlavorTranslatable = 0x04,
     kFlavorDefault = kFlavorEnableOverride | kFlavorToSubclass
   };
@@ -35,8 +36,8 @@ public:
   virtual unsigned int GetScope(TCIMContext const& context) const = 0;   // a set of EScope
   virtual unsigned int GetFlavor(TCIMContext const& context) const = 0;  // a set of EFlavor
 
-  // The value of a qualifier that is written without one. NULL when there is no default, but always of the declared type and
-  // with the declared array bound.
+  // The value of a qualifier that is written without a value. NULL when there is no default. It always has the declared type
+  // and array bound.
   virtual TCIMValue GetDefaultValue(TCIMContext const& context) const = 0;
 };
 

@@ -12,8 +12,8 @@
 
 namespace NQRVZEP20 {
 
-// Host, port, user name and password of the latest session, kept even when opening it failed; empty before the first session
-// and after IpmilanCloseConnect.
+// Host, port, user name and password of the latest session that was opened or failed to open; empty before the first one and
+// after IpmilanCloseConnect.
 ZEP_EXPORT extern std::string gIPMILanHost;
 ZEP_EXPORT extern std::string gIPMILanPort;
 ZEP_EXPORT extern std::string gIPMILanUser;
@@ -26,7 +26,8 @@ constexpr int MAXMULTINODE = 16;  // nodes of a server
 //
 // A server has up to 16 nodes (0 to 15), each with a controller and an account of its own. The process has one link, which
 // TRootObject::GetipmiLanIns returns, and one session at a time. No lock is taken: use the link from one thread at a time.
-// Opening and closing a session and bringing up the USB-LAN block for the network.
+// The operations that open or close a session or bring up the USB-LAN block until the network responds or a time limit has
+// passed.
 class ZEP_EXPORT IIPMILan {
 public:
   static constexpr int MAXMULTINODE = NQRVZEP20::MAXMULTINODE;
@@ -46,33 +47,33 @@ public:
   // Stores the account of a node. An index above 15 is logged and changes nothing; a negative index changes nothing.
   void setAccount(int index, std::string user, std::string password);
 
-  // The account and the host in use. While m_useGlobalAccount is set they are those of the session (gIPMILanUser,
-  // gIPMILanPass, gIPMILanHost), otherwise those of the current node; empty while there is no current node.
+  // The account and the host in use. While m_useGlobalAccount is true, they are those of the session (gIPMILanUser,
+  // gIPMILanPass, gIPMILanHost). Otherwise they are those of the current node, and empty while there is no current node.
   std::string getCurrentUser();
   std::string getCurrentPassword();
   std::string getCurrentHost();
 
   // ---- Session ----
 
-  // Brings up the USB-LAN of every node whose USB-LAN is down, through the three functions of ./ovdusblan.so (relative to
-  // the working directory, loaded for the duration of the call). Returns false when the library or one of its functions is
-  // missing, when the library throws, and, without trying, while m_useGlobalAccount is set. The result of bringing up a
-  // single node is not examined.
+  // Brings up the USB-LAN of every node whose USB-LAN is down, through the three functions of ./ovdusblan.so. The library is
+  // searched in the working directory and loaded for the duration of the call. Returns false when the library or one of its
+  // functions is missing or the library throws, otherwise true: the result for a single node is ignored. While
+  // m_useGlobalAccount is true, does nothing and returns false.
   bool bringupOvdLan();
 
-  // Opens a session on port 623. The parameters are remembered even when opening fails. Returns whether the session is open.
-  // The password is written to the log in clear text, at debug severity. Kept.
+  // Opens a session on port 623. The arguments are stored (gIPMILanHost and the others) even when opening fails. Returns
+  // whether the session is open. The password is written to the log in clear text, at debug severity. Kept.
   bool IpmilanOpenConnect(std::string host, std::string user, std::string password);
 
   // Makes `node` (0 to 15) the current node, brings up the USB-LAN of all nodes, and opens a session with the node's
   // controller at its USB-LAN address, with the node's account. A node outside that range also becomes the current one; its
-  // address and account are empty. `pluginName` is used in log lines only. When `node` is already the current node and
-  // getipmiLanStatus is true, the session is reused and the result is true. Returns false, without trying, while m_enabled
-  // is 0 or m_useGlobalAccount is set. An int that a platform library throws is logged and gives false; other exceptions
-  // pass through.
+  // address and account are empty. `pluginName` is used in log lines only. If `node` is already the current node and
+  // getipmiLanStatus is true, the session is reused and the result is true. While m_enabled is 0 or m_useGlobalAccount is
+  // true, does nothing and returns false. If a platform library throws an int, the int is logged and the result is false;
+  // other exceptions pass through.
   bool IpmiInBandLanConnect(int node, std::string pluginName);
 
-  // Closes the session and the socket, forgets the session's parameters and makes getipmiLanStatus false.
+  // Closes the session and the socket, clears gIPMILanHost and the others, and makes getipmiLanStatus false.
   void IpmilanCloseConnect();
 
   // Whether a response has passed ChkResponse since the last Initialize or IpmilanCloseConnect.
@@ -94,27 +95,27 @@ public:
   sockaddr_in getSaServer();
   bool closeSocket();  // always true
 
-  // The IPMI checksum of the bytes at the offsets `first` to `last`: the bytes and the checksum add up to 0 modulo 256. It
-  // is 0 when `last` is less than `first`.
+  // Returns the IPMI checksum of the bytes at the offsets `first` to `last`: the sum of the bytes and the checksum is 0
+  // modulo 256. The checksum is 0 when `last` is less than `first`.
   char GenSum(char* buffer, int first, int last);
 
-  // Validates a response packet: RMCP header, session header starting at byte 4, a 16-byte authentication code unless byte 4
-  // is 0, message length, message. `lengthPosition` is the offset of the length byte in a packet that has an authentication
-  // code. `mode` 0 tests the checksum and the completion code, 1 the checksum, 2 the completion code, any other value
-  // nothing. Success makes getipmiLanStatus true; failure does not change it. A byte before the start of the packet is not
-  // read and fails the test that needs it. After the length byte the buffer must hold as many bytes as the length says, and
-  // at least 7.
+  // Validates a response packet. The packet consists of the RMCP header, the session header, which starts at byte 4, an
+  // authentication code of 16 bytes unless byte 4 is 0, the message length and the message. `lengthPosition` is the offset of
+  // the length byte in a packet with an authentication code, also for a packet without one. `mode` 0 tests the checksum and
+  // the completion code, 1 the checksum, 2 the completion code, any other value nothing. Success makes getipmiLanStatus true;
+  // failure does not change it. A test that would need a byte before the start of the packet fails. After the length byte,
+  // the buffer must contain as many bytes as the message length, and at least 7.
   bool ChkResponse(char* packet, int lengthPosition, int mode);
 
   static IIPMILan* fgipmilanInstance;             // null before Initialize
   static std::string m_LANMapping[MAXMULTINODE];  // the USB-LAN address of each node's controller
 
-  // ---- Set by the caller. The link reads the two flags and hands out the rest. ----
+  // ---- Fields that the caller sets. The link reads the two flags; the operations above return the other fields. ----
 
   std::array<char, 20> m_sessionID{};
   std::array<char, 40> m_address{};
   std::array<char, 20> m_password{};
-  bool m_useGlobalAccount = false;  // bypasses the nodes' accounts and USB-LAN
+  bool m_useGlobalAccount = false;  // true: the accounts and the USB-LAN of the nodes are not used
   int m_enabled = 1;                // 0: IpmiInBandLanConnect does nothing
   int m_socket = -1;                // closed by closeSocket and IpmilanCloseConnect; -1: none
   sockaddr_in m_saServer{};

@@ -9,8 +9,8 @@
 
 namespace NQRVZEP20 {
 
-// The library's one channel for diagnostic text. TRootObject::GetCoreLogger() returns the calling thread's logger; TLogger
-// documents each operation.
+// The interface through which the library writes all diagnostic text. TRootObject::GetCoreLogger() returns the calling
+// thread's logger; TLogger documents each operation.
 class ZEP_EXPORT ILogger {
 public:
   enum EZEPLogSeverity : int {
@@ -19,7 +19,7 @@ public:
     kLogStatus = 2,
     kLogDebug = 3,
     kLogVerbose = 4,
-    kLogMemoryOnly = 100,       // recorded in the in-memory list whatever the threshold; never written
+    kLogMemoryOnly = 100,       // recorded in the in-memory list whatever the threshold is; never written to a file
     kLogMemoryOnlyAlways = 101  // the same, recorded with this severity
   };
 

@@ -5,8 +5,8 @@
 
 namespace NQRVZEP20 {
 
-// The base of the object that a consumer plug-in's factory function creates. Consumers read namespaces. Host and consumer
-// agree on a class of their own derived from this one; the library only passes the pointer on.
+// The base class of the object that the factory function of a consumer plug-in creates. Consumers read namespaces. Host and
+// consumer agree on a class derived from this one; the library only passes the pointer on.
 class ZEP_EXPORT INamespaceConsumer {
 public:
   virtual ~INamespaceConsumer();

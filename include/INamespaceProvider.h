@@ -5,8 +5,8 @@
 
 namespace NQRVZEP20 {
 
-// A provider plug-in's entry object. The plug-in creates one when it is loaded and registers it with
-// TNamespaceProviderManager, which files it under its name and keeps it until the end of the process.
+// The entry object of a provider plug-in. The plug-in creates one when it is loaded and registers it with
+// TNamespaceProviderManager, which stores it under its name until the end of the process.
 class ZEP_EXPORT INamespaceProvider {
 public:
   virtual ~INamespaceProvider();
@@ -14,8 +14,8 @@ public:
   // The name under which the provider is registered. Called once, at registration, with an empty context.
   virtual std::string const& GetName(TCIMContext const& context) const = 0;
 
-  // The namespace that the provider owns, the same one on each call. The first call may block while the provider collects
-  // its data. Empty when the provider has no namespace to offer, as in this default body.
+  // The namespace of the provider, which owns it; the same one on each call. The first call may block while the provider
+  // collects its data. Empty when the provider has no namespace. Has a default body, which returns an empty pointer.
   virtual boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& /*context*/) { return {}; }
 };
 

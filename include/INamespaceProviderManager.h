@@ -5,15 +5,16 @@
 
 namespace NQRVZEP20 {
 
-// The registry of namespace providers, as a host sees it; TRootObject::GetNamespaceProviderManager() returns it.
+// The registry of namespace providers; TRootObject::GetNamespaceProviderManager() returns it.
 //
-// No lock is taken: providers are expected to register while plug-ins load, before several threads use the registry.
+// No lock is taken: load all plug-ins, which registers their providers, before several threads use the registry.
 class ZEP_EXPORT INamespaceProviderManager {
 public:
   virtual ~INamespaceProviderManager();
 
-  // Registers the provider under the name that its GetName returns. The first provider of a name stays; a second one is
-  // dropped silently. Kept. Names are compared byte by byte, so case matters. An empty pointer is a failed assertion.
+  // Registers the provider under the name that its GetName returns. The first provider of a name stays; a second one of the
+  // same name is silently ignored. Kept. Names are compared byte by byte, so case matters. An empty pointer is a failed
+  // assertion.
   virtual void RegisterNamespaceProvider(boost::shared_ptr<INamespaceProvider> provider) = 0;
 
   // Logs an error and throws kZEPStatusNotFound when no provider has that name.

@@ -7,8 +7,8 @@
 
 namespace NQRVZEP20 {
 
-// An enumeration callback that collects: it appends each element to `elements`, which must outlive it, and never stops the
-// enumeration.
+// An enumeration callback that appends each element to `elements` and never stops the enumeration. `elements` must outlive
+// it.
 //
 //   std::vector<boost::shared_ptr<ICIMInstance>> instances;
 //   cls->EnumerateInstances(TAddToVectorCallback<ICIMInstance>(instances), TCIMContext());

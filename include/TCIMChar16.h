@@ -31,8 +31,8 @@ public:
   // The code in decimal: 65 gives "65". Throws kZEPStatusInvalidDateTime for a NULL character.
   std::string ToString() const;
 
-  // Both return true for any two characters, whatever their codes: all characters are equal, and each is less than every
-  // other. Do not sort or deduplicate with these operators. Both throw kZEPStatusInvalidDateTime when either character is
+  // Both return true for any two characters, whatever their codes are: any two characters are equal, and each is less than
+  // the other. Do not sort or deduplicate with these operators. Both throw kZEPStatusInvalidDateTime when either character is
   // NULL. Kept.
   bool operator==(TCIMChar16 const& other) const;
   bool operator<(TCIMChar16 const& other) const;

@@ -23,8 +23,8 @@ public:
   // The code in decimal. Throws kZEPStatusInvalidDateTime for a NULL character.
   std::string ToString() const;
 
-  // All four return true, whatever the codes are. They throw kZEPStatusInvalidDateTime when either character is NULL. Kept.
-  // An empty pointer is a failed assertion.
+  // All four operators return true, whatever the codes are. They throw kZEPStatusInvalidDateTime when either character is
+  // NULL. Kept. An empty pointer is a failed assertion.
   bool operator==(TCIMChar16Impl const& other) const;
   bool operator<(TCIMChar16Impl const& other) const;
   bool operator==(boost::shared_ptr<TCIMChar16Impl> const& other) const;

@@ -6,8 +6,8 @@
 
 namespace NQRVZEP20 {
 
-// The char16 kind of a TCIMValue's data. The value is then not NULL, but the character may be; printing or comparing a NULL
-// character throws kZEPStatusInvalidDateTime.
+// The data of a TCIMValue that is a char16. Such a value is not NULL, but its character may be NULL; printing or comparing a
+// NULL character throws kZEPStatusInvalidDateTime.
 class ZEP_EXPORT TCIMChar16ValueImpl : public TCIMValueImpl {
 public:
   TCIMChar16ValueImpl(TCIMChar16 const& character);
@@ -16,7 +16,7 @@ public:
 
   operator TCIMChar16() const override;
 
-  // The code in decimal, whatever the radix.
+  // The code in decimal, whatever the radix is.
   std::string ToString(unsigned char radix) const override;
 
   // Compare as TCIMChar16 does: any two characters are equal, and each is less than the other.

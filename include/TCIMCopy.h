@@ -25,47 +25,48 @@ class ICIMQualifier;
 class ICIMQualifierDecl;
 class TCIMReference;
 
-// Copies the schema of one namespace into another, and the instances of the collector's own product record. The two may
-// belong to different plug-ins: everything goes through the interfaces, with empty contexts.
+// Copies the schema of one namespace into another, and the instances of QRVSG_ZEPProduct, the collector's own product record.
+// The two namespaces may belong to different plug-ins: the copy uses only the interfaces, with empty contexts.
 //
-// A property declaration that throws TZEPException is logged, at debug severity, and left out. Any other failure (a class
-// that is there already, a superclass that is not, a static value whose declaration was left out, whatever a plug-in throws)
-// passes through and ends the copy; what was made in the destination by then stays. An empty pointer returned by the
-// destination is treated as kZEPStatusNotFound, before anything else is done; only its GetPropertyDecl may return one, for a
-// property that is not declared yet. An empty pointer that the caller passes is a failed assertion. Only CopyInstance takes
-// a lock.
+// If copying a property declaration throws TZEPException, the copy logs that at debug severity and leaves the declaration
+// out. Any other exception passes through and ends the copy, for example because a class already exists, a superclass is
+// missing, or a static value belongs to a declaration that was left out. The elements created by then stay in the
+// destination. An empty pointer returned by the destination counts as if that call had thrown kZEPStatusNotFound; only
+// GetPropertyDecl may return one, for a property that is not declared yet. An empty pointer passed by the caller is a failed
+// assertion. Only CopyInstance takes a lock.
 class ZEP_EXPORT TCIMCopy {
 public:
-  // Qualifier declarations, then the classes whose flag (ICIMClass::GetClassFlag) is not set, then those whose flag is, so
-  // that an association finds the classes that it refers to. Instances are those of the class QRVSG_ZEPProduct itself, not
-  // of its subclasses, unless `noProductInstances`, the class is abstract, or it carries the qualifier PLUGINNAME.
+  // Copies the qualifier declarations, then the classes that are not associations (ICIMClass::GetClassFlag), then the
+  // associations, whose referenced classes exist by then. Copies the instances of the class QRVSG_ZEPProduct itself, not of
+  // its subclasses, unless `noProductInstances` is true, the class is abstract, or it carries the qualifier PLUGINNAME.
   static void CopyClasses(boost::shared_ptr<ICIMNamespace> src, boost::shared_ptr<ICIMNamespace> dst, bool noProductInstances);
 
-  // One class with its qualifiers and declarations, without instances. Its superclass and the qualifier declarations are in
-  // `dst` already.
+  // Copies one class with its qualifiers, declarations and static values, without instances. Its superclass and the qualifier
+  // declarations must already exist in `dst`.
   static void CopyClass(boost::shared_ptr<ICIMClass> cls, boost::shared_ptr<ICIMNamespace> dst);
 
-  // One instance into the class of the same name. A property that is NULL is passed over: in the copy it has the default of
-  // the destination class. Holds copyInstMutex throughout, so that of two threads that copy one waits.
+  // Copies one instance into the class of the same name. A property that is NULL is skipped: in the copy it has the default
+  // of the destination class. Holds copyInstMutex during the call, so only one thread at a time copies an instance.
   static void CopyInstance(boost::shared_ptr<ICIMInstance> inst, boost::shared_ptr<ICIMNamespace> dst);
 
-  // The value as one of `dst`: a reference, also one that is NULL or an element of an array, refers to the class of the same
-  // name there and has its keys carried over. Other values come back as they are. Throws kZEPStatusNotFound when `dst` has
-  // no such class.
+  // Returns the value for use in `dst`. A reference, also a NULL one or one in an array, then refers to the class of the same
+  // name in `dst`; its keys are copied. Throws kZEPStatusNotFound when `dst` has no such class. Any other value is returned
+  // unchanged.
   static TCIMValue CopyValue(TCIMValue const& v, boost::shared_ptr<ICIMNamespace> dst);
 };
 
 }  // namespace NQRVZEP20
 
-// Held by CopyInstance. Whoever keeps instances from being copied for a while holds it, too.
+// Held by CopyInstance during the copy of an instance. A caller may hold it to delay such copies.
 extern ZEP_EXPORT boost::recursive_mutex copyInstMutex;
 
 namespace NQRVZEP20 {
 using ::copyInstMutex;
 }
 
-// ---- The steps of the copy: callbacks for the enumerations of the source. Each holds where it writes to, and returns true,
-//      so that the enumeration goes on. The namespace is held weakly; once it is gone a step works with an empty pointer. ----
+// ---- The steps of the copy: callbacks for the enumerations of the source. Each stores its destination and always returns
+//      true, so that the enumeration continues. The namespace is held by a weak pointer; a step that needs the namespace
+//      after its destruction causes a failed assertion. ----
 
 class ZEP_EXPORT TCopyQualifierDecls {
 public:
@@ -76,7 +77,7 @@ private:
   boost::weak_ptr<NQRVZEP20::ICIMNamespace> fDestination;
 };
 
-// A class and all below it, as TCopyClass copies each.
+// Copies a class and every class below it, each as TCopyClass does.
 class ZEP_EXPORT TCopyClassTree {
 public:
   TCopyClassTree(boost::weak_ptr<NQRVZEP20::ICIMNamespace> destination, bool associations, bool noProductInstances);
@@ -88,8 +89,8 @@ private:
   bool fNoProductInstances;
 };
 
-// A class whose flag (ICIMClass::GetClassFlag, set for associations) equals `associations`, with its instances when it is the
-// product class; any other class is passed over.
+// Copies a class whose ICIMClass::GetClassFlag (true for associations) equals `associations`, with its instances if it is the
+// product class. Skips any other class.
 class ZEP_EXPORT TCopyClass {
 public:
   TCopyClass(boost::weak_ptr<NQRVZEP20::ICIMNamespace> destination, bool associations, bool noProductInstances);
@@ -101,7 +102,7 @@ private:
   bool fNoProductInstances;
 };
 
-// A qualifier on `target`: a class, a property, a method or a parameter.
+// Copies a qualifier to `target`: a class, or the declaration of a property, a method or a parameter.
 class ZEP_EXPORT TCopyQualifier {
 public:
   TCopyQualifier(boost::weak_ptr<NQRVZEP20::ICIMNamespace> destination, boost::shared_ptr<NQRVZEP20::ICIMNamedElement> target);
@@ -164,7 +165,7 @@ private:
   boost::shared_ptr<NQRVZEP20::ICIMInstance> fTarget;
 };
 
-// A key binding of a reference, into `target`, which has its class and outlives the callback.
+// Copies a key binding of a reference into `target`, whose class must be set and which must outlive the callback.
 class ZEP_EXPORT TCopyReferenceKeys {
 public:
   TCopyReferenceKeys(boost::weak_ptr<NQRVZEP20::ICIMNamespace> destination, NQRVZEP20::TCIMReference& target);

@@ -15,7 +15,7 @@ class TCIMDateTimeImpl;
 //
 // A plain value: copies are deep and share nothing. A new one is NULL; printing, comparing or adding a NULL throws
 // kZEPStatusInvalidDateTime. Not synchronised: use one object from one thread at a time. Validation, comparison and
-// arithmetic of timestamps go through the C library's mktime and localtime and so depend on the process's time zone.
+// arithmetic of timestamps use mktime and localtime of the C library and therefore depend on the time zone of the process.
 class ZEP_EXPORT TCIMDateTime {
 public:
   TCIMDateTime();
@@ -28,7 +28,7 @@ public:
   TCIMDateTime& operator=(TCIMDateTime const& other);
   ~TCIMDateTime();
 
-  // ---- Setting. A Set that refuses its arguments throws kZEPStatusInvalidDateTime and keeps the old value. ----
+  // ---- Setting. A Set with invalid arguments throws kZEPStatusInvalidDateTime and keeps the old value. ----
 
   // Reads the 25-character CIM text: "yyyymmddHHMMSS.mmmmmm+uuu" (or "-uuu"; minutes east of UTC) for a timestamp,
   // "ddddddddHHMMSS.mmmmmm:000" for an interval.
@@ -38,16 +38,16 @@ public:
   // `microSeconds` 0 to 999999.
   void Set(unsigned int days, unsigned short hours, unsigned short minutes, unsigned short seconds, unsigned int microSeconds);
 
-  // Makes this a timestamp; `utcOffset` is in minutes east of UTC. The fields are valid when mktime can convert them; since
-  // mktime normalises, month 13 and second 75 pass. 1 January 1970 is valid at any time of day. `microSeconds` is not
-  // checked. Kept.
+  // Makes this a timestamp; `utcOffset` is in minutes east of UTC. The fields are valid when mktime can convert them; mktime
+  // normalises fields that are out of range, so month 13 and second 75 are valid. 1 January 1970 is valid at any time of day.
+  // `microSeconds` is not checked. Kept.
   void Set(unsigned short year, unsigned short month, unsigned int day, unsigned short hour, unsigned short minute,
            unsigned short second, unsigned int microSeconds, short utcOffset);
 
   void SetPrecision(bool precision);  // stored for GetPrecision; affects neither text nor comparison
   void Clear();                       // makes this NULL
 
-  // ---- Fields. Those of a NULL datetime are meaningless. ----
+  // ---- Fields. The fields of a NULL datetime have no meaning. ----
 
   bool IsNull() const;
   bool IsInterval() const;
@@ -67,17 +67,18 @@ public:
   std::string ToString() const;  // the 25-character CIM text; longer when a field has too many digits
 
   // A readable text: "03/15/2007 14:30:00" (no microseconds, no offset), or "2 days 1 hour 5 milliseconds " for an interval,
-  // with the trailing blank. A zero interval gives an empty text.
+  // with the trailing blank. The text of a zero interval is empty.
   std::string ToUIString() const;
 
-  // ---- Comparison. Timestamps compare by the instant they denote, then by microseconds; intervals by their length.
+  // ---- Comparison. Timestamps are compared by the instant that they denote, then by microseconds; intervals by their length.
   //      Throws kZEPStatusInvalidDateTime when either is NULL, or when one is a timestamp and the other an interval. ----
 
   bool operator==(TCIMDateTime const& other) const;
   bool operator<(TCIMDateTime const& other) const;
 
   // ---- Arithmetic. The operands do not change. Throws kZEPStatusInvalidDateTime when either is NULL or when the C library
-  //      cannot convert the time. Results before 1970 or beyond the platform's limit follow localtime. ----
+  //      cannot convert the time. A resulting timestamp before 1970 has no meaning: its seconds since 1970 lose their sign,
+  //      and its microseconds may exceed 999999. Kept. ----
 
   // Interval + interval gives an interval. Timestamp + interval, in either order, gives a timestamp with the UTC offset of
   // the timestamp. Adding two timestamps throws kZEPStatusInvalidDateTime.

@@ -9,8 +9,8 @@
 
 namespace NQRVZEP20 {
 
-// The body of a TCIMDateTime: its fields and the rules for them. Use TCIMDateTime, which documents every operation; this
-// class is public because TCIMDateTime::GetBody returns it.
+// The implementation of a TCIMDateTime: its fields and the rules for them. Use TCIMDateTime, which documents every operation;
+// this class is public because TCIMDateTime::GetBody returns it.
 //
 // A plain value; a new one is NULL. Not synchronised.
 class ZEP_EXPORT TCIMDateTimeImpl {

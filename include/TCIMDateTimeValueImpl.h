@@ -6,7 +6,7 @@
 
 namespace NQRVZEP20 {
 
-// The datetime kind of a TCIMValue's data.
+// The data of a TCIMValue that is a datetime.
 class ZEP_EXPORT TCIMDateTimeValueImpl : public TCIMValueImpl {
 public:
   TCIMDateTimeValueImpl(TCIMDateTime const& dateTime);
@@ -15,7 +15,7 @@ public:
 
   operator TCIMDateTime() const override;
 
-  // The CIM text, whatever the radix. This and the comparisons throw kZEPStatusInvalidDateTime for a NULL datetime.
+  // The CIM text, whatever the radix is. ToString and the comparisons throw kZEPStatusInvalidDateTime for a NULL datetime.
   std::string ToString(unsigned char radix) const override;
 
   bool operator==(TCIMValue const& other) const override;

@@ -5,8 +5,8 @@
 
 namespace NQRVZEP20 {
 
-// The numeric kind of a TCIMValue's data: a boolean, an integer or a real. It can be converted only to exactly the type that
-// is stored; any other conversion throws kZEPStatusTypeMismatch.
+// The data of a TCIMValue that is a boolean, an integer or a real. They can be converted only to exactly the stored type; any
+// other conversion throws kZEPStatusTypeMismatch.
 class ZEP_EXPORT TCIMNumericValueImpl : public TCIMValueImpl {
 public:
   TCIMNumericValueImpl(bool value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeBoolean), fBoolean(value) {}
@@ -35,13 +35,14 @@ public:
   operator float() const override;
   operator double() const override;
 
-  // `radix` is 10, 16 or 8; any other value throws kZEPStatusNotSupported, for a boolean too. Unsigned integers print in all
-  // three: base 16 uses capitals and pads with zeros to the width of the type, base 8 does not pad. Signed integers and
-  // reals print in base 10 only and throw kZEPStatusNotSupported for 8 and 16. A boolean prints "true" or "false". A real
-  // prints six significant digits, in the form that printf gives for %g, with a point in any locale.
+  // `radix` is 10, 16 or 8; any other value throws kZEPStatusNotSupported, for a boolean too. Unsigned integers can be
+  // printed in all three: base 16 uses capitals and pads with zeros to the width of the type, base 8 does not pad. Signed
+  // integers and reals can be printed in base 10 only and throw kZEPStatusNotSupported for 8 and 16. A boolean is printed as
+  // "true" or "false". A real is printed as printf prints it for %g: six significant digits, and a decimal point in any
+  // locale.
   std::string ToString(unsigned char radix) const override;
 
-  // Values of different types are neither equal nor ordered: uint8 5 and uint16 5 compare false both ways. Kept. A NaN is
+  // Values of different types are neither equal nor ordered: for uint8 5 and uint16 5, == and < return false. Kept. A NaN is
   // not equal to anything, not even to itself, and < is false when either side is a NaN.
   bool operator==(TCIMValue const& other) const override;
   bool operator<(TCIMValue const& other) const override;
@@ -54,7 +55,7 @@ private:
 
 protected:
   TCIMValue::TCIMType fType;  // kCIMTypeBoolean to kCIMTypeReal64
-  union {                     // the member of that type
+  union {                     // only the member that fType selects is set
     bool fBoolean;
     unsigned char fUint8;
     signed char fSint8;

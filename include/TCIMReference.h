@@ -21,14 +21,15 @@ class TCIMReferenceImpl;
 
 // A CIM object path in parsed form: a namespace, a class and the key bindings.
 //
-// The namespace is held by a weak pointer: a reference never keeps it alive. Copies are deep and share only the class and
-// the resolved element. Keys can be added only once a class is set, and the class can be changed only while there are no
+// The namespace is held by a weak pointer: a reference never keeps it alive. Copies are deep and share only the class and the
+// resolved element. Keys can be added only after a class has been set, and the class can be changed only while there are no
 // keys; any other order throws kZEPStatusInvalidOpSequence. Exceptions thrown by the namespace pass through unless a comment
-// says otherwise. A moved-from reference can only be assigned to or destroyed; any other use is a failed assertion. Not
-// synchronised.
+// says otherwise. A reference that was moved from can only be assigned to or destroyed; any other use is a failed assertion.
+// Not synchronised.
 class ZEP_EXPORT TCIMReference {
 public:
-  // An empty reference in the namespace `ns`. `context` is passed to the namespace whenever a class is looked up by name.
+  // Creates a reference in the namespace `ns`, without a class and keys. `context` is passed to the namespace whenever a
+  // class is looked up by name.
   TCIMReference(boost::shared_ptr<ICIMNamespace> ns, TCIMContext context);
 
   // The same, followed by SetPath(path).
@@ -42,15 +43,16 @@ public:
 
   // ---- Paths ----
 
-  // The class name and the keys in byte order of their names, such as `X_Disk.Id="5",Name="a\"b"`. The namespace is not
-  // printed. Each quote and backslash in a value is escaped with a backslash, but the path of a reference value is printed
-  // raw. Kept.
+  // Returns the class name and the keys, in byte order of their names, such as `X_Disk.Id="5",Name="a\"b"`. The namespace is
+  // not printed. Each quote and backslash in a value is escaped with a backslash, but the path of a reference value is
+  // printed without escaping. Kept.
   std::string GetPath() const;
 
-  // Reads a path into a reference that has a live namespace, no class and no keys. Keys are read only after a namespace
-  // prefix (`ns:X_Disk.Id="5"`), which is dropped; without a prefix the whole text is taken as a class name. Kept. Malformed
-  // paths, unknown classes and keys, and references nested more than 100 deep are logged as errors and throw
-  // kZEPStatusInvalidReference; the parts read before the error stay set. A key that occurs twice keeps its first value.
+  // Reads a path. The reference must have a namespace that still exists, no class and no keys; otherwise throws
+  // kZEPStatusInvalidOpSequence. Keys are read only after a namespace prefix (`ns:X_Disk.Id="5"`), which is not stored;
+  // without a prefix the complete text is read as a class name. Kept. Malformed paths, unknown classes and keys, and
+  // references nested more than 100 deep are logged as errors and throw kZEPStatusInvalidReference; the parts read before the
+  // error stay set. If a key occurs twice, its first value counts.
   void SetPath(std::string const& path);
 
   // ---- Parts ----
@@ -58,24 +60,24 @@ public:
   boost::shared_ptr<ICIMNamespace> GetNamespace() const;  // empty after the namespace has been destroyed
   void SetNamespace(boost::shared_ptr<ICIMNamespace> ns);
 
-  // A label for the caller's own use: the library stores it, and neither parsing nor printing uses it.
+  // A label for the caller's own use: the library only stores it. Neither parsing nor printing uses it.
   std::string GetNameSpaceName() const;
   void SetNameSpaceName(std::string name);
 
   boost::shared_ptr<ICIMClass> GetClass() const;  // empty until set
   void SetClass(boost::shared_ptr<ICIMClass> cls);
-  std::string GetClassName() const;  // without a class: a failed assertion
+  std::string GetClassName() const;  // a failed assertion when no class is set
 
   // Looks the class up in the namespace and sets it. Throws boost::bad_weak_ptr when the namespace has been destroyed; the
   // namespace throws kZEPStatusNotFound when it has no such class.
   void SetClassName(std::string const& name);
 
-  // Binds a key. Logs an error and throws kZEPStatusTypeMismatch when the type of the value is not the declared type; throws
-  // kZEPStatusNotFound when the class has no such property. The first binding of a name wins: a later one is dropped
-  // silently. Kept.
+  // Adds the value of a key. Logs an error and throws kZEPStatusTypeMismatch when the type of the value is not the declared
+  // type; throws kZEPStatusNotFound when the class has no such property. The first value of a name counts: a later one is
+  // silently ignored. Kept.
   void AddKeyValue(std::string const& name, TCIMValue const& value);
 
-  // Calls back with each (name, value) in byte order of the names until a call returns false.
+  // Calls `callback` with the name and value of each key, in byte order of the names, until a call returns false.
   void EnumerateKeyBindings(boost::function<bool(std::pair<std::string, TCIMValue>)> callback) const;
 
   void SetContext(TCIMContext context);
@@ -83,8 +85,9 @@ public:
 
   // ---- Resolving ----
 
-  // The class when `classOnly` is true or there are no keys; otherwise the instance that this path names in the class's
-  // namespace. The instance is looked up once and then remembered. Throws kZEPStatusNotFound when there is none.
+  // Returns the class when `classOnly` is true or there are no keys; otherwise the instance that this path names in the
+  // namespace of the class. The instance is looked up until it is found, and then stored. Throws kZEPStatusNotFound when
+  // there is none.
   boost::shared_ptr<ICIMElement> GetCIMElement(bool classOnly) const;
 
   // ---- Comparison. Two references are equal when they have the same class object and equal keys. References with the same

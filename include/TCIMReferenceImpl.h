@@ -15,7 +15,7 @@ namespace NQRVZEP20 {
 
 class ICIMPropertyDecl;
 
-// The body of a TCIMReference: its fields and rules. TCIMReference forwards every operation to this class and documents it.
+// The implementation of a TCIMReference. TCIMReference documents every operation and forwards it to this class.
 class ZEP_EXPORT TCIMReferenceImpl {
 public:
   TCIMReferenceImpl(TCIMReference& owner, boost::shared_ptr<ICIMNamespace> ns, TCIMContext context);
@@ -26,9 +26,9 @@ public:
 
   void SetOwner(TCIMReference& owner) noexcept { fOwner = owner; }
 
-  // Reads `path` into `target`, starting at `pos`, and advances `pos` past the text that was read. A `pos` other than 0 is
-  // the opening quote of a reference that is the value of a key in an enclosing path; reading then stops at the closing
-  // quote or at the end of the path. A missing closing quote is not detected.
+  // Reads `path` into `target`, starting at `pos`, and advances `pos` past the text that was read. If `pos` is not 0, it is
+  // the position of the opening quote of a reference that is a key value in an enclosing path; reading then stops at the
+  // closing quote or at the end of the path. A missing closing quote is not detected.
   static void ParsePath(TCIMReferenceImpl& target, std::string const& path, std::size_t& pos);
   static void ParsePath(TCIMReference& target, std::string const& path, std::size_t& pos) {
     ParsePath(*target.GetBody(), path, pos);

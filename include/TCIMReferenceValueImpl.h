@@ -6,7 +6,7 @@
 
 namespace NQRVZEP20 {
 
-// The reference kind of a TCIMValue's data: an object path.
+// The data of a TCIMValue that is a reference: an object path.
 class ZEP_EXPORT TCIMReferenceValueImpl : public TCIMValueImpl {
 public:
   TCIMReferenceValueImpl(TCIMReference const& reference);
@@ -15,7 +15,7 @@ public:
 
   operator TCIMReference() const override;
 
-  // The path, whatever the radix.
+  // The path, whatever the radix is.
   std::string ToString(unsigned char radix) const override;
 
   // Compare as TCIMReference does.

@@ -16,11 +16,12 @@ class ICIMNamespace;
 //
 // Unless its comment says otherwise, a query reads one property of the only instance of its class. It throws
 // kZEPStatusNotFound when the class or the property is missing or the class does not have exactly one instance. For a value
-// that is NULL or not a string it throws what the conversion of TCIMValue throws. Other exceptions thrown by the namespace
-// pass through.
+// that is NULL it throws kZEPStatusValueIsNULL, and for a value that is not a string kZEPStatusTypeMismatch. Other exceptions
+// thrown by the namespace pass through.
 //
-// Every query passes the namespace a context that names the provider: the entry kContextName with the value kPluginNSPName.
-// A query with a `context` argument adds that entry to the caller's entries, unless the caller's context already has it.
+// Every query passes the namespace a context that names the provider: the entry kContextName with the value kPluginNSPName. A
+// query with a `context` argument adds that entry to the caller's entries, unless the caller's context has an entry
+// kContextName of its own.
 class ZEP_EXPORT TCIMSchemaHelper {
 public:
   static std::string const kSystemCreationClassName;           // "QRVSG_ComputerSystem"
@@ -48,9 +49,9 @@ public:
   // and logs the reason at debug severity.
   static std::string GetRawMTMString(boost::shared_ptr<ICIMNamespace> ns);
 
-  // The machine type and model found in the product name, whose forms are "Server X1-[1234ABC]-", "Server X1-[1234]-",
-  // "1234ABC" and "1234". A few older models are recognised by their names, which have forms of their own. Throws
-  // kZEPStatusInvalidFormat for any other form.
+  // The machine type and model in the product name, which has the form "Server X1-[1234ABC]-", "Server X1-[1234]-", "1234ABC"
+  // or "1234"; trailing blanks are ignored. The product names of a few older models have other forms, which are recognised,
+  // too. Throws kZEPStatusInvalidFormat for any other form, and kZEPStatusNotFound as GetRawMTMString does.
   static std::string GetMTM(boost::shared_ptr<ICIMNamespace> ns);
   static std::string GetMachineType(boost::shared_ptr<ICIMNamespace> ns);  // the first 4 characters of GetMTM
   static std::string GetModelNumber(boost::shared_ptr<ICIMNamespace> ns);  // the last 3
@@ -64,9 +65,11 @@ public:
 
   // ---- Serial number ----
 
-  static std::string GetRawSerialNumberString(boost::shared_ptr<ICIMNamespace> ns, TCIMContext context);  // as GetRawMTMString
+  // The serial number, unchanged. Fails as GetRawMTMString does.
+  static std::string GetRawSerialNumberString(boost::shared_ptr<ICIMNamespace> ns, TCIMContext context);
 
-  // The serial number without trailing blanks. Throws kZEPStatusInvalidFormat unless it is exactly 7 letters or digits.
+  // The serial number without trailing blanks. Throws kZEPStatusInvalidFormat unless it consists of exactly 7 letters or
+  // digits, and kZEPStatusNotFound as GetRawSerialNumberString does.
   static std::string GetSerialNumber(boost::shared_ptr<ICIMNamespace> ns, TCIMContext context);
 
   // ---- Parts of the data source's version, such as 3.20.5. Each throws kZEPStatusNotFound when a dot is missing. ----
@@ -79,16 +82,16 @@ public:
   // ---- VMware ESXi hosts, which are described by other classes. These queries examine every instance and return "Unknown"
   //      when the data is missing. ----
 
-  // The last "Model" among the CIM_PhysicalElement instances that contains both "-[" and "]-".
+  // The property "Model" of the last CIM_PhysicalElement instance in which it contains both "-[" and "]-".
   static std::string GetSystemProductName_vmwesxi(boost::shared_ptr<ICIMNamespace> ns);
-  static std::string GetMTM_vmwesxi(boost::shared_ptr<ICIMNamespace> ns);  // the text between "-[" and "]-" of that
+  static std::string GetMTM_vmwesxi(boost::shared_ptr<ICIMNamespace> ns);  // the text between "-[" and "]-" in that name
 
-  // The last "LargeBuildNumber" of the VMware_HypervisorSoftwareIdentity instances, a text or a number.
+  // The last "LargeBuildNumber", a text or an integer, among the VMware_HypervisorSoftwareIdentity instances.
   static std::string GetOperatingSystemName_vmwesxi(boost::shared_ptr<ICIMNamespace> ns);
 
-  // The last "SerialNumber" of the OMC_Chassis instances; throws kZEPStatusNotFound when there is no instance. When it is a
-  // placeholder, "XxXxXxX" or "none", the result is the text after the ":" of the first "OtherIdentifyingInfo" entry of
-  // OMC_UnitaryComputerSystem that contains a ":".
+  // The property "SerialNumber" of the last OMC_Chassis instance that has it; throws kZEPStatusNotFound when there is no
+  // instance. If it is a placeholder, "XxXxXxX" or "none", the result is the text after the first ":" in the first entry with
+  // a ":" of the array "OtherIdentifyingInfo", in the last OMC_UnitaryComputerSystem instance that has such an entry.
   static std::string GetSerialNumber_vmwesxi(boost::shared_ptr<ICIMNamespace> ns, TCIMContext context);
 };
 

@@ -5,7 +5,7 @@
 
 namespace NQRVZEP20 {
 
-// The string kind of a TCIMValue's data: bytes in no particular encoding.
+// The data of a TCIMValue that is a string: bytes in any encoding.
 class ZEP_EXPORT TCIMStringValueImpl : public TCIMValueImpl {
 public:
   TCIMStringValueImpl(std::string const& text);
@@ -15,10 +15,10 @@ public:
 
   operator std::string() const override;
 
-  // The text itself, neither quoted nor escaped, whatever the radix.
+  // The text itself, neither quoted nor escaped, whatever the radix is.
   std::string ToString(unsigned char radix) const override;
 
-  // Compare unsigned bytes, so case matters. False for a value that is not a string.
+  // Compare the texts as unsigned bytes, so case matters. False for a value that is not a string.
   bool operator==(TCIMValue const& other) const override;
   bool operator<(TCIMValue const& other) const override;
 

@@ -24,10 +24,10 @@ class TCIMValueImpl;
 // One typed CIM value. Every property value, method argument, key value and array element that crosses the library's
 // interface is a TCIMValue.
 //
-// A value is a type tag and, unless it is NULL, the data. A NULL value has a tag too: a property can be a NULL uint32, or a
-// NULL array of string with at most 8 elements. Copies are deep and share nothing except the referenced class. Conversions
-// out of a value are strict: the requested type must be exactly the stored type. Not synchronised: concurrent reads are
-// safe, a write needs exclusive access.
+// A value consists of a type tag and, unless it is NULL, the data. A NULL value also has a tag: a property can be a NULL
+// uint32, or a NULL array of string with at most 8 elements. Copies are deep and share nothing except the referenced class. A
+// value can be converted only to exactly the C++ type of its tag. Not synchronised: concurrent reads are safe, a write needs
+// exclusive access.
 class ZEP_EXPORT TCIMValue {
 public:
   // The type tag: a CIM intrinsic type, and whether it is an array of that type.
@@ -61,8 +61,8 @@ public:
 
     operator ECIMType() const noexcept { return fType; }
 
-    // The CIM name of the base type: an array of sint32 prints "sint32", without an array mark. Kept. Throws
-    // kZEPStatusTypeMismatch for tag 0 and for a base type above 15.
+    // The CIM name of the base type: the name of an array of sint32 is "sint32", too. Kept. Throws kZEPStatusTypeMismatch for
+    // tag 0 and for a base type above 15.
     std::string ToString() const;
 
   private:
@@ -96,12 +96,13 @@ public:
   TCIMValue(TCIMType type, unsigned int maxArraySize, std::vector<TCIMValue> const& elements);
 
   // A scalar read from text. `text` is not modified; `ns` is used for references only. Numbers are read in decimal, as a
-  // standard stream in the classic locale reads them: leading white space is skipped, reading stops at the first character
-  // that cannot continue the number, a text without a number and a number that does not fit its type give 0, and a negative
-  // number read as an unsigned type wraps around. uint8 and sint8 are read as 32-bit numbers and cut to 8 bits without a
-  // range check. A boolean is the word "true" or "false"; anything else gives false. A char16 is a NULL character, whatever
-  // the text is (see TCIMChar16). Kept. Throws kZEPStatusTypeMismatch for tag 0, tags above 15 and arrays,
-  // kZEPStatusInvalidDateTime for a malformed datetime, and what TCIMReference::SetPath throws for a malformed reference.
+  // standard stream in the classic locale reads them: leading white space is skipped, and reading stops at the first
+  // character that cannot continue the number. A text without a number, or with a number that does not fit its type, gives 0.
+  // A negative number that is read as an unsigned type wraps around. uint8 and sint8 are read as 32-bit numbers and cut to 8
+  // bits without a range check. A boolean is the word "true" or "false"; anything else gives false. A char16 is a NULL
+  // character, whatever the text is (see TCIMChar16). Kept. Throws kZEPStatusTypeMismatch for tag 0, tags above 15 and
+  // arrays, kZEPStatusInvalidDateTime for a malformed datetime, and the exceptions of TCIMReference::SetPath for a malformed
+  // reference.
   TCIMValue(TCIMType type, std::string& text, boost::shared_ptr<ICIMNamespace> ns);
 
   TCIMValue(TCIMValue const& other);
@@ -110,10 +111,10 @@ public:
 
   // ---- Assignment ----
 
-  // Assignment first compares the two values with ==, and so throws what == throws. If they are equal it changes nothing at
-  // all: the value keeps its own referenced class and maximum array size. Kept. Otherwise it takes over the tag and the
-  // data, the maximum array size only of an array, and the referenced class only of a reference. A value may be assigned
-  // from itself or from one of its own elements.
+  // Assignment first compares the two values with ==, whose exceptions pass through. If they are equal, nothing changes: the
+  // value keeps its own referenced class and maximum array size. Kept. Otherwise assignment copies the tag and the data; from
+  // an array also the maximum array size, from a reference also the referenced class. A value may be assigned from itself or
+  // from one of its own elements.
   TCIMValue& operator=(TCIMValue const& other);
   TCIMValue& operator=(TCIMValue&& other);
   void Set(TCIMValue const& other);
@@ -122,7 +123,7 @@ public:
   // ignored otherwise.
   void SetNullValue(TCIMType::ECIMType type, unsigned int arraySize);
 
-  // These replace the data and the tag; the referenced class and the maximum array size do not change.
+  // These operations replace the data and the tag; the referenced class and the maximum array size do not change.
   void Set(bool value);
   void Set(unsigned char value);
   void Set(signed char value);
@@ -144,8 +145,8 @@ public:
 
   // Makes this an array of `type` holding a copy of the elements. `maxArraySize` is the declared bound, 0 for none; it is
   // never compared with the number of elements. An element of another type is logged as an error and throws
-  // kZEPStatusInvalidProperty; one whose tag has no name throws kZEPStatusTypeMismatch and is not logged. The elements are
-  // checked after the assignment, so the value keeps the new array even then. Kept.
+  // kZEPStatusInvalidProperty; an element whose tag has no name throws kZEPStatusTypeMismatch and is not logged. The elements
+  // are checked after the assignment, so the value holds the new array even if the check throws. Kept.
   void Set(TCIMType type, unsigned int maxArraySize, std::vector<TCIMValue> const& elements);
 
   // Sets the referenced class of a NULL value. If the value is not NULL, throws kZEPStatusInvalidOpSequence and changes
@@ -179,15 +180,15 @@ public:
   operator TCIMDateTime() const;
   operator TCIMReference() const;
 
-  // The elements themselves, which can be edited in place; edits are not checked. The returned reference is valid until the
-  // value is next changed or destroyed.
+  // The elements themselves, not a copy: they can be changed in place, without a check. The returned reference is valid until
+  // the value is next changed or destroyed.
   operator std::vector<TCIMValue>&() const;
 
-  // The value as text. `radix` is 8, 10 or 16; 8 and 16 are for unsigned integers, and base 16 prints capitals padded with
-  // zeros to the width of the type. Strings, datetimes, char16 and references ignore the radix. Strings are neither quoted
-  // nor escaped; an array prints "{ a, b }". Throws kZEPStatusValueIsNULL for a NULL value or element. For a boolean or a
-  // number, throws kZEPStatusNotSupported when the radix is none of the three, or is 8 or 16 and the number is signed or
-  // real.
+  // The value as text. `radix` is 8, 10 or 16; only unsigned integers can be printed with 8 and 16, and with 16 they have
+  // capital letters and are padded with zeros to the width of the type. Strings, datetimes, char16 and references ignore the
+  // radix. Strings are neither quoted nor escaped; an array is printed as "{ a, b }". Throws kZEPStatusValueIsNULL for a NULL
+  // value or element. For a boolean or a number, throws kZEPStatusNotSupported for any other radix, and for a signed integer
+  // or a real also for 8 and 16.
   std::string ToString(unsigned char radix = 10) const;
 
   // ---- Comparisons. NULL sorts first; other values are ordered by tag and then by data. <= and > evaluate == first.
@@ -204,7 +205,7 @@ private:
   friend class TCIMValueImpl;
 
   // Owns the data of one value. A number, the smallest and most frequent kind, is stored inside the value and needs no
-  // allocation; every other kind is on the heap.
+  // allocation; every other kind is allocated on the heap.
   class TData {
   public:
     TData() noexcept : fImpl(nullptr) {}
@@ -239,7 +240,7 @@ private:
   unsigned int fMaxArraySize;
 };
 
-// Writes the name that TCIMType::ToString returns; throws what it throws.
+// Writes the name that TCIMType::ToString returns; its exceptions pass through.
 ZEP_EXPORT std::ostream& operator<<(std::ostream& stream, TCIMValue::TCIMType const& type);
 
 // Named values that a caller passes along with an object model operation. Empty unless an operation says otherwise.

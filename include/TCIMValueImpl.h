@@ -9,7 +9,8 @@
 
 namespace NQRVZEP20 {
 
-// The data of a TCIMValue that is not NULL. Each kind of CIM type has a class derived from this one.
+// The data of a TCIMValue that is not NULL. There is one derived class for each kind of data: numbers, strings, datetimes,
+// char16, references and arrays.
 //
 // Every conversion of this base class throws kZEPStatusTypeMismatch; a kind overrides those that it supports. An object is
 // not changed after construction (except the elements of a TCIMArrayValueImpl), so any number of threads may read it.
@@ -48,8 +49,8 @@ protected:
   TCIMValueImpl(TCIMValueImpl const&) = default;
   TCIMValueImpl& operator=(TCIMValueImpl const&) = delete;
 
-  // The data of `value`, whose tag the caller has checked to be that of TKind. Throws kZEPStatusValueIsNULL for a NULL
-  // value.
+  // The data of `value`. The caller has checked that the tag of `value` belongs to TKind. Throws kZEPStatusValueIsNULL for a
+  // NULL value.
   template <class TKind>
   static TKind const& DataOf(TCIMValue const& value) {
     return static_cast<TKind const&>(DataOf(value));

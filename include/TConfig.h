@@ -15,10 +15,10 @@ namespace NQRVZEP20 {
 //   path=a=b        the first "=" ends the key
 //   flag            a line without "=" is a key that maps to itself
 //
-// Nothing is stripped: blanks and carriage returns belong to the key or the value. A line whose key or value is empty is
-// skipped, and of two lines with the same key the first counts. No operation throws for a missing or malformed file. A
-// missing or empty file is logged as an error, and so is a file that cannot be read to its end, of which no line is used. A
-// file that cannot be opened, and lines that are not settings, are skipped silently. Kept.
+// Nothing is stripped: blanks and carriage returns are part of the key or the value. A line whose key or value is empty is
+// skipped. Of two lines with the same key the first counts. No operation throws for a missing or malformed file. A missing or
+// empty file is logged as an error. A file that cannot be read to its end is also logged as an error, and none of its lines
+// is used. A file that cannot be opened, and lines that are not settings, are silently ignored. Kept.
 //
 // The library uses one TConfig, which reads the file on first use; a file created or changed later has no effect. The first
 // call of GetInstance must come from one thread, during start-up; afterwards any thread may read.
@@ -30,8 +30,9 @@ public:
   // Reads the file.
   TConfig();
 
-  // Destroying any TConfig first destroys the one of the process, if there is one, and GetInstance then returns a dangling
-  // pointer. So create no other TConfig in a program that uses GetInstance, and never delete the returned pointer. Kept.
+  // Destroying any other TConfig also destroys the one of the process, if there is one; GetInstance then returns a dangling
+  // pointer. Kept. Therefore do not create another TConfig in a program that uses GetInstance, and do not delete the pointer
+  // that GetInstance returns.
   ~TConfig();
   TConfig(TConfig const&) = delete;
   TConfig& operator=(TConfig const&) = delete;
@@ -45,7 +46,7 @@ public:
   // Every key, in ascending byte order. When there are no settings at all, logs an error and returns an empty vector.
   std::vector<std::string> listKeys();
 
-  static TConfig* cfgInstance;  // null until its first use
+  static TConfig* cfgInstance;  // null until GetInstance is first called
 
 private:
   std::map<std::string, std::string> fSettings;

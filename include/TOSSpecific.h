@@ -22,33 +22,33 @@ class TPluginManagerProvider;  // the host's handle for the machine-identificati
 // ".nsp.so", the file name ending of every namespace provider library.
 ZEP_EXPORT extern std::string const kNSPExtension;
 
-// Two flags of the process, initially false, that front ends set and read (setLuz, setZEPParser). The library itself uses
-// neither. Set them once, during start-up.
+// Two flags of the process, initially false, for front ends: setLuz and setZEPParser set them, getLuz and isZEPParser read
+// them. The library itself does not use them. Set them once, during start-up.
 ZEP_EXPORT extern bool isLuz;
 ZEP_EXPORT extern bool isParser;  // whether the process runs as the collector's parser
 
 // The destination of a download.
 struct TCurlWriteContext {
-  std::string fPath;   // the file to append to; empty: there is none
+  std::string fPath;   // the file to append to; empty when there is none
   std::FILE* fStream;  // open only while a chunk is written
 };
 
 // libcurl's write callback for downloads: appends `count` items of `size` bytes to the file of the TCurlWriteContext, which
-// it opens and closes for each chunk. Returns the number of items written, 0 when closing the file fails (the chunk did not
-// reach the disk), and 0xFFFFFFFF when there is no context or no path or the file cannot be opened. Any result other than
-// `count` stops libcurl; the data already written stays.
+// it opens and closes for each chunk. Returns the number of items written; 0 when closing the file fails, because the chunk
+// may then not be on the disk; 0xFFFFFFFF when there is no context, the path is empty, or the file cannot be opened. Any
+// result other than `count` stops libcurl; the data already written stays.
 ZEP_EXPORT unsigned long curl_fwrite(void* data, unsigned long size, unsigned long count, void* context);
 
 // One removable medium.
 struct TRemovableMedium {
   std::string fDevice;       // "/dev/sdb"
   std::string fDescription;  // a readable name: "Example Virtual Disk"
-  std::string fMountPoint;   // "/mnt/key"; empty when it could not be mounted
+  std::string fMountPoint;   // "/mnt/key"; empty when mounting failed
 };
 
 // Every service of the operating system that the library uses. Static operations only. Each operation runs on the caller's
-// thread and blocks it until done; none takes a lock. Failures are thrown as TZEPException unless an operation says
-// otherwise.
+// thread and blocks it until done; none takes a lock, except to log. Failures are thrown as TZEPException unless the comment
+// of an operation says otherwise.
 class ZEP_EXPORT TOSSpecific {
 public:
   // ---- Files, directories, paths and environment (TOSSpecificFiles.cpp) ----
@@ -67,15 +67,15 @@ public:
   static long GetFileSize(std::string path);
 
   // Copies the contents of a file. A missing destination is created with the source's permission bits minus the umask. An
-  // existing destination keeps its own bits and is not truncated: if it is longer than the source, its old tail remains. A
-  // short write is neither completed nor reported. Kept. Any other failure throws kZEPStatusFileSystemError; the part
-  // already copied remains.
+  // existing destination keeps its own bits and is not truncated: if it is longer than the source, the rest of its old
+  // contents remains. A short write is neither completed nor reported. Kept. Any other failure throws
+  // kZEPStatusFileSystemError; the part already copied remains.
   static void FileCopy(std::string from, std::string to);
 
   // Copies the files of a directory, following links, and with `recursive` also its subdirectories. `to` is created when it
-  // is missing, but its parents are not. An entry that cannot be examined, such as a dangling link, is skipped. Kept.
-  // Returns the result of closing the source directory, 0. Throws kZEPStatusFileSystemError when a directory cannot be
-  // opened, and what CreateDir and FileCopy throw; the files already copied remain.
+  // is missing, but its parents are not. An entry that cannot be examined, such as a dangling link, is skipped. Kept. Returns
+  // the result of closing the source directory, 0. Throws kZEPStatusFileSystemError when a directory cannot be opened;
+  // exceptions of CreateDir and FileCopy pass through. The files already copied remain.
   static int DirCopy(std::string from, std::string to, bool recursive);
 
   // The names, not the paths, of all entries except "." and "..", in the order in which the system lists them. Throws
@@ -127,20 +127,20 @@ public:
   static bool breakApartVersion(std::string& tail, std::string& head);
 
   // Splits a list of zero-terminated strings. `separator` ends the first string only; a zero byte ends each later one. A
-  // string whose end is at offset `length` - 2 or later is dropped, so pass a length at least 3 larger than the offset of
-  // the last string's zero byte. Kept. Reads no byte at or after the offset `length`.
+  // string whose end is at offset `length` - 2 or later is dropped. Kept. To get all strings, pass a `length` at least 3
+  // larger than the offset of the last string's zero byte. Reads no byte at or after the offset `length`.
   static std::vector<std::string> multiStringTok(char* buffer, unsigned long length, char separator);
 
   // ---- Console, time and host probes (TOSSpecificConsole.cpp) ----
 
-  // The current local time, to the millisecond. The UTC offset is that of the zone's standard time, plus 60 while daylight
-  // saving is in force, even in a zone that shifts by half an hour or, as Ireland does in winter, backwards. Kept. TZ is
-  // read on each call.
+  // The current local time, to the millisecond. The UTC offset is that of the zone's standard time, plus 60 minutes while
+  // daylight saving is in force. It is therefore wrong in a zone that shifts by another amount, such as 30 minutes, or -60 in
+  // Ireland's winter. Kept. TZ is read on each call.
   static TCIMDateTime GetLocalTime();
 
-  // Whether a key press is waiting on standard input; also true when select fails. Kept. Never blocks. The local modes of
-  // the terminal (echo, waiting for Enter, signals from keys) are off during the call. Do not call it from two threads at
-  // once.
+  // Whether standard input has data to read, such as a key press; also true when select fails. Kept. Never blocks. The local
+  // modes of the terminal (echo, waiting for Enter, signals from keys) are off during the call. Do not call it from two
+  // threads at once.
   static bool IsKeyWaiting();
 
   // Waits for one character on standard input and returns it, or EOF at the end of the input and on error. The character is
@@ -154,11 +154,11 @@ public:
   // Whether the real user ID is root's.
   static bool IsAdmin();
 
-  // 0 on the control domain of a Xen host, 1 on a guest domain, 2 when /proc/xen/capabilities does not exist. Throws what
-  // CaptureFile throws when the file exists but cannot be read.
+  // 0 on the control domain of a Xen host, 1 on a guest domain, 2 when /proc/xen/capabilities does not exist. When the file
+  // exists but cannot be read, the exceptions of CaptureFile pass through.
   static int GetRunningTypeOnXen();
 
-  // Runs "sh" and waits until it ends. Returns the result of system().
+  // Runs the command "sh" with system(), waits until it ends, and returns the result of system().
   static int LaunchCommandShell();
 
   // Copies `argc` to `newArgc` and `argv` to `newArgv`; nothing is expanded on this platform.
@@ -171,23 +171,23 @@ public:
 
   // ---- Processes and captured output (TOSSpecificProcess.cpp) ----
   //
-  // The standard output and standard error of a child go to one pipe, which the caller's thread reads until the last process
+  // The standard output and standard error of a child go to one pipe. The caller's thread reads it until the last process
   // that has it open closes it. The child inherits everything else: standard input, every open descriptor that is not marked
-  // close-on-exec, working directory, signal mask and ignored signals. The pipes of children that other threads start are
-  // marked close-on-exec, so no child delays the end of another one's output. The cost of starting a child does not depend
-  // on the caller's memory size; pthread_atfork handlers are not run. Kept. Several threads may run children at the same
-  // time; a stack of 32 KiB is enough.
+  // close-on-exec, working directory, signal mask and ignored signals. Each pipe is marked close-on-exec, so a child that
+  // another thread starts cannot keep it open. The cost of starting a child does not depend on the caller's memory size;
+  // pthread_atfork handlers are not run. Kept. Several threads may run children at the same time; a stack of 32 KiB is
+  // enough.
   //
   // `timeout` is the longest silence allowed between two chunks of output, in seconds; it does not limit the total run time.
-  // -1 waits for ever. A child that is silent for longer is neither killed nor waited for. Kept.
+  // -1 waits for ever. A child that writes nothing for longer is neither ended nor waited for. Kept.
   //
   // Output is appended as it arrives. A zero byte discards the rest of the chunk (at most 4095 bytes) that contains it.
   // Kept.
   //
-  // The result is 0 when the child ran to its end and exited with 0, and -1 in every other case; the exit code itself is not
-  // returned, nor is the 255 of a program that could not be executed. Kept. A select or waitpid that a signal interrupts is
-  // not retried. When the pipe's read end is a descriptor that select cannot watch (1024 and above), nothing is run and the
-  // result is -1. When no process can be created, an error is logged and kZEPStatusFail is thrown.
+  // The result is 0 when the child exited with 0, and -1 in every other case, also when the program could not be executed.
+  // The exit code itself is not returned. Kept. A select or waitpid that a signal interrupts is not retried. When the pipe's
+  // read end is a descriptor that select cannot watch (1024 and above), nothing is run and the result is -1. When no process
+  // can be created, an error is logged and kZEPStatusFail is thrown.
 
   // Runs the file `path` with `argv0` as its name, the arguments `args`, and exactly the environment `env` (entries
   // "NAME=value").
@@ -204,16 +204,17 @@ public:
   // empty argument. Quotes have no special meaning. Kept.
   static std::string SpawnProcess(std::string commandLine, int timeout);
 
-  // Runs a program that writes the file `fileName` (timeout 300 seconds; output and result ignored) and reads that file into
-  // `contents`. Does not throw: a failure is logged as an error and leaves `contents` empty.
+  // Runs a program that writes the file `fileName`, and reads that file into `contents`. The timeout is 300 seconds; the
+  // output and the result of the program are ignored. Kept. Does not throw: a failure to read the file or to start a process
+  // is logged as an error and leaves `contents` empty.
   static void CapFileViaProc(std::string program, std::vector<std::string> args, std::string fileName, std::string& contents);
 
   // The complete contents of a file, which are also logged at debug severity. A file that cannot be opened is logged as an
-  // error and throws kZEPStatusFileNotFound; for a failing read see GetFileContents.
+  // error and throws kZEPStatusFileNotFound; a failing read is handled as in GetFileContents.
   static std::string CaptureFile(std::string path);
 
-  // The complete contents of a file. A file that cannot be opened is logged in two lines at debug severity and gives an
-  // empty text. For `logContents` and a failing read see GetFileContents.
+  // The complete contents of a file. A file that cannot be opened is logged in two lines at debug severity and gives an empty
+  // text. `logContents` and a failing read are handled as in GetFileContents.
   static std::string CaptureFileLoader(std::string path, bool logContents);
 
   // Everything from the current position of `fd` to the end of the file, zero bytes included. The descriptor stays open.
@@ -221,9 +222,9 @@ public:
   // logged at status severity and throws kZEPStatusFileSystemError.
   static std::string GetFileContents(int fd, std::string path, bool logContents);
 
-  // Copies the file into the working directory ("/" when that cannot be determined) and opens the copy in vi, which gets a
-  // pattern of the last 35 characters of the path. A shorter path throws std::out_of_range after the copy. Paths are not
-  // quoted for the shell. Kept.
+  // Copies the file into the working directory, or to "/" when that cannot be determined, and opens the copy in vi: the name
+  // is given as a shell pattern, the last 35 characters of the path between two "*". A shorter path throws std::out_of_range
+  // after the copy. Paths are not quoted for the shell. Kept.
   static void LaunchTextEditor(std::string path);
 
   // ---- Plug-ins (TOSSpecificPlugins.cpp) ----
@@ -249,17 +250,18 @@ public:
   static std::vector<std::string> FindPlugins(std::string root, std::string kind);
   static std::vector<std::string> FindPlugins(std::string root);  // of the kind "pi"
 
-  // The base names of the libraries of that kind in the root path, in directory order. A library is any non-directory whose
-  // name contains ".<kind>"; its base name is the name without its first three and last seven characters, whatever these are
-  // (a shorter name gives an empty base name). Kept. Throws kZEPStatusFileSystemError when the root path cannot be opened.
+  // The base names of the libraries of that kind in the root path, in directory order. A library is any entry that is not a
+  // directory and whose name contains ".<kind>". Its base name is the name without its first three and last seven characters,
+  // whatever these are; a shorter name gives an empty base name. Kept. Throws kZEPStatusFileSystemError when the root path
+  // cannot be opened.
   static std::vector<std::string> FindNSServices(std::string kind);
   static std::vector<std::string> FindNSPs();  // of the kind "nsp"
   static std::vector<std::string> FindNSCs();  // of the kind "nsc"
 
-  // The path of a plug-in file's companion document: the plug-in's path up to ".<kind>.so", without the first "lib" in the
-  // path (even one in a directory name; kept), followed by the document's ending. For the kind "cmpi" no "lib" is removed.
-  // Throws kZEPStatusFail when the path contains no ".<kind>.so" or no "lib", and std::out_of_range when the first "lib"
-  // comes only after ".<kind>.so".
+  // The path of a document that belongs to a plug-in file: the plug-in's path up to ".<kind>.so", without the first "lib" in
+  // the path, even one in a directory name, followed by the document's ending. Kept. For the kind "cmpi" no "lib" is removed.
+  // Throws kZEPStatusFail when the path contains no ".<kind>.so" or no "lib", and std::out_of_range when the first "lib" is
+  // after ".<kind>.so".
   static std::string BuildRegistrationPath(std::string pluginPath, std::string kind);
   static std::string BuildSpecificationPath(std::string pluginPath, std::string kind);
   static std::string BuildSpecificationPath(std::string pluginPath);  // of the kind "pi"
@@ -280,7 +282,7 @@ public:
   // ---- Machine identification (TOSSpecificMachine.cpp) ----
   //
   // Each call reads SMBIOS again, through the platform library libsmbios.so, which is loaded when first needed. When a text
-  // cannot be read, the operation returns its default and logs the reason at debug severity; nothing throws.
+  // cannot be read, the operation returns its default and logs the reason at debug severity; no operation throws.
   //
   // The product description is split at its first "-", wherever that is. Kept. "Server Q100 -[1234AB7]-" gives the name
   // "Server Q100 " with its trailing blank, the type "1234" and the model "AB7". "1234AB7" alone gives only the type. An
@@ -293,50 +295,50 @@ public:
   static std::string GetMachineSN();
   static std::string GetMachineModel();
   static std::string GetMachineName();
-  static std::string GetOperatingSystemName();  // the machine name, not the operating system's. Kept.
+  static std::string GetOperatingSystemName();  // returns the machine name. Kept.
   static std::string GetMachineType();          // 4 characters; default "0000"
 
-  // The machine type that belongs to the BIOS build prefix; for an unknown prefix, the result of GetMachineType.
+  // The machine type to which the BIOS build prefix belongs; for an unknown prefix, the result of GetMachineType.
   static std::string GetMachineTypeFromID();
 
   // The first two characters, or the only one, of the BIOS version in SMBIOS structure type 0, without its brackets. "00"
   // when the version is empty or cannot be read.
   static std::string GetBiosID();
 
-  // Copies string `number` (1 is the first) of an SMBIOS string set of `length` bytes to `output`, which the caller provides
-  // large enough and cleared. The zero byte is copied for every string but the first. Returns 1 when the string was found,
-  // otherwise 0. The empty string that ends the set is not one of its strings. Reads no byte at or after the offset
-  // `length`.
+  // Copies string `number` (1 is the first) of an SMBIOS string set of `length` bytes to `output`. The caller provides
+  // `output`, large enough for the string and filled with zeros: the zero byte of the first string is not copied. Returns 1
+  // when the string was found, otherwise 0. The empty string that ends the set is not a string of the set. Reads no byte at
+  // or after the offset `length`.
   static int getBIDString(char* stringSet, char* output, int length, int number);
 
   // The identity of a remote server, read from the FRU data of its management controller with IPMI over the LAN (port 623)
   // through the platform library libipmiClient.so: serial number (GetRemoteMSN), machine type (GetRemoteMT) and model. Each
-  // call opens a session, which replaces the one that was open, and leaves it open. Kept. The result is empty when no
-  // session can be opened, and "N/A" when the query fails. Otherwise a serial number always has 7 characters and a type 4;
-  // missing ones are zero bytes. Do not call these from two threads at once.
+  // call opens a session, which replaces the one that was open, and leaves it open. Kept. The result is empty when no session
+  // can be opened, and "N/A" when the query fails. Otherwise a serial number always has 7 characters and a machine type 4;
+  // missing characters are zero bytes. Do not call these operations from two threads at once.
   static std::string GetRemoteMSN(std::string host, std::string user, std::string password);
   static std::string GetRemoteMT(std::string host, std::string user, std::string password);
   static std::string GetRemoteMachineModel(std::string host, std::string user, std::string password);
 
   // Marks the start of a debug session: creates or truncates the file "<path><machine type><local time>.log", such as
-  // "/tmp/zep_123420240303-090507.log", where a null `path` means "/var/log/QRV_Support/zep_" (in the OEM variant
-  // "/var/log/OEM_Support/zep_"). The complete path is cut after 255 bytes. Nothing is written to the file, and a failure to
-  // create it is not reported. Kept. Then, if `level` is 0 to 4, sets the logger's threshold to it and returns true; any
-  // other level leaves the threshold unchanged and returns false.
+  // "/tmp/zep_123420240303-090507.log" for the `path` "/tmp/zep_". A null `path` stands for "/var/log/QRV_Support/zep_", in
+  // the OEM variant for "/var/log/OEM_Support/zep_". The complete path is cut after 255 bytes. Nothing is written to the
+  // file, and a failure to create it is not reported. Kept. Then, if `level` is 0 to 4, sets the logger's threshold to it and
+  // returns true; any other level leaves the threshold unchanged and returns false.
   static bool SetDebugLevel(int level, char* path);
 
   // ---- File transfer (TOSSpecificTransfer.cpp) ----
   //
   // Each call loads libcurl and unloads it again. It tries libcurl.so and libcurl.so.4 in the directory of the core library,
-  // then libcurl.so, .4, .3 and .2 on the dynamic linker's search path. Do not make a call while another one runs: they
-  // share libcurl's global state.
+  // then libcurl.so, libcurl.so.4, .3 and .2 on the dynamic linker's search path. Do not make two calls at the same time:
+  // they share libcurl's global state.
   //
-  // URLs are used unchanged: write a blank as "%20". A user name and password are part of the URL. FTP uses plain passive
-  // mode (PASV). No proxy is used, not even one from the environment. There is no timeout: a server that stops responding
-  // blocks the caller. Kept.
+  // URLs are used unchanged: the caller writes a blank as "%20". The user name and password are part of the URL. FTP uses
+  // plain passive mode (PASV). No proxy is used, not even one from the environment. There is no timeout: a server that stops
+  // responding blocks the caller. Kept.
 
-  // Uploads the file to the URL or, with `download`, downloads the URL into the file. Missing directories are created on the
-  // server, by a download from an FTP server too. Kept.
+  // Uploads the file to the URL or, with `download`, downloads the URL into the file. The missing directories of the URL are
+  // created on the server; a download from an FTP server creates them, too. Kept.
   //
   // When the local file of a download already exists, the operation asks on standard output whether to overwrite it, until
   // it reads "y", "Y", "n" or "N" from standard input. After "n" or "N", at the end of the input, and when the file cannot
@@ -362,7 +364,7 @@ public:
   // Prints "Remote file name = name.xml.gz" on standard output and uploads to ftp://host/name.xml.gz.
   static void UserFTPFile(std::string host, std::string localFile, std::string name);
 
-  // Fetches a web page, fixed when the library is built, through the proxy and appends it to ./content.html.
+  // Fetches a web page through the proxy and appends it to ./content.html. The page is set when the library is built.
   // `userAndPassword` is "user:password"; the last argument is not used. Returns kZEPStatusOK when a response was received,
   // even if it is the proxy's refusal: examine the file. Kept. A failing fetch is logged as an error and returns
   // kZEPStatusConnectionFailed when the proxy is unknown or cannot be connected to, otherwise kZEPStatusAccessDenied. When
@@ -378,35 +380,37 @@ public:
   // The commands "mount" and "umount", run through the shell, mount and unmount devices. Names are put into the command line
   // without quoting: check every name before passing it. Kept.
 
-  // Mounts a device, or if that fails its first partition (the device's name followed by "1"), and returns the mount point:
-  // "/mnt/floppy" for exactly "/dev/floppy", "/dev/fd0" and "/dev/fd1", "/mnt/key" for any other device. When something is
-  // already mounted there, it stays and nothing is mounted, even if it is another device. Kept. The mount point must exist.
-  // Throws kZEPStatusFileSystemError when neither can be mounted; the command's error message is discarded.
+  // Mounts a device or, if that fails, its first partition (the device's name followed by "1"). Returns the mount point:
+  // "/mnt/floppy" for exactly "/dev/floppy", "/dev/fd0" and "/dev/fd1", "/mnt/key" for any other device. When a device is
+  // already mounted there, even another one, nothing is mounted and the mount point is returned. Kept. The mount point must
+  // exist. Throws kZEPStatusFileSystemError when neither device nor partition can be mounted; the command's error message is
+  // discarded.
   static std::string MountDevice(std::string device);
 
   // Unmounts `mountPoint`; the device is ignored. Kept. Throws kZEPStatusFileSystemError when the command fails.
   static void UnmountDevice(std::string device, std::string mountPoint);
 
-  // Appends to `devices` the device files of the virtual devices that the management controller presents to this host, as
-  // the program "hwinfo" reports them. `kind` is 0 for disks, 1 for CD-ROMs, 2 for keyboards, 3 for mice; for any other kind
-  // nothing is run. With `keepWhole`, an alias in parentheses after a name ("/dev/sdc (/dev/sg3)") stays part of the text,
-  // except for CD-ROMs; without `keepWhole` it is removed. Kept. Nothing is appended when hwinfo is missing. If it is silent
-  // for 300 seconds, only its output up to then is used.
+  // Appends to `devices` the device files of the virtual devices that the management controller presents to this host, as the
+  // program "hwinfo" reports them. `kind` is 0 for disks, 1 for CD-ROMs, 2 for keyboards, 3 for mice; for any other kind
+  // nothing is run. An alias in parentheses after a name ("/dev/sdc (/dev/sg3)") is removed; with `keepWhole` it stays, but
+  // not for CD-ROMs. Kept. Nothing is appended when hwinfo is missing. If it is silent for 300 seconds, only its output up to
+  // then is used.
   static void getxBMCVirtualDevices(int kind, std::vector<std::string>& devices, bool keepWhole);
 
-  // Finds the USB disks among the instances of the namespace's class QRVSG_SCSIDevice and mounts each as MountDevice does,
-  // creating /mnt/key when it is missing. Returns them in the order of the instances, followed by the floppy drive, not
-  // mounted, when the machine has one.
+  // Finds the USB disks among the instances of the namespace's class QRVSG_SCSIDevice and mounts each as MountDevice does;
+  // creates /mnt/key when it is missing. Returns the disks in the order of the instances. If the machine has a floppy drive,
+  // it follows as the last medium, with the mount point "/mnt/floppy", but is not mounted.
   //
   // A disk is an instance whose DeviceType is "Direct Access Device". Its DeviceID is its SCSI address, written
-  // "host:channel:target:lun" as Linux does, or a generic SCSI node such as "/dev/sg2", from which the address is read. Its
-  // device is the node among /dev/sda to /dev/sdz that has this address. It is a USB disk when sysfs shows a USB device
-  // above it and the kernel's list of USB devices contains that device or cannot be read; for a disk that sysfs does not
-  // know, the word "USB" anywhere in the list decides. The description is VendorID and ProductID.
+  // "host:channel:target:lun" as Linux does, or a generic SCSI node such as "/dev/sg2", which is queried for its address. Its
+  // device is the node among /dev/sda to /dev/sdz that has this address. It is a USB disk when sysfs shows a USB device above
+  // it and the kernel's list of USB devices contains that device or cannot be read. A disk that sysfs does not know is a USB
+  // disk when the list contains the word "USB" anywhere. The description consists of VendorID and ProductID.
   //
-  // All disks share one mount point: only the first disk is mounted, and the others are returned with the same mount point.
-  // Kept. Nodes that cannot be queried, instances without a node and failures to mount are logged at debug severity.
-  // Exceptions thrown by the namespace pass through, such as kZEPStatusNotFound when it has no such class.
+  // All disks share one mount point: only the first disk that can be mounted is mounted, and the disks after it are returned
+  // with the same mount point. Kept. Nodes that cannot be queried, instances without a node and failures to mount are logged
+  // at debug severity. Exceptions thrown by the namespace pass through, such as kZEPStatusNotFound when it does not have the
+  // class QRVSG_SCSIDevice.
   static std::vector<TRemovableMedium> EnumerateRemovableMedia(boost::shared_ptr<ICIMNamespace> ns);
 
   // ---- Log (TOSSpecificLog.cpp) ----

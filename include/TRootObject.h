@@ -9,7 +9,7 @@ namespace NQRVZEP20 {
 class IIPMILan;
 class ILogger;
 
-// A host's access to the process-wide objects. Static operations only.
+// Access to the objects of which the process has one, or one per thread. Static operations only.
 class ZEP_EXPORT TRootObject {
 public:
   static boost::shared_ptr<INamespaceProviderManager> GetNamespaceProviderManager();

@@ -7,7 +7,7 @@
 
 namespace NQRVZEP20 {
 
-// The status codes of the library. Every failure that is reported by a TZEPException carries one of them.
+// The status codes of the library. Every TZEPException carries one of them.
 enum EZEPStatusCode : int {
   kZEPStatusOK = 0,
   kZEPStatusNotImplemented,
@@ -55,7 +55,7 @@ enum EZEPStatusCode : int {
   fdrStatusEnd  // not a status: the number of statuses above; its text is its own name
 };
 
-// One status code as a value. It converts implicitly from an enumerator and compares with one. Any thread may read it.
+// One status code as a value. It converts implicitly from an enumerator and can be compared with one. Any thread may read it.
 class ZEP_EXPORT TZEPStatusCode {
 public:
   TZEPStatusCode(EZEPStatusCode code = kZEPStatusOK) noexcept : fCode(code) {}
