@@ -76,8 +76,8 @@ void KeepALog() {
 void HandleError(boost::shared_ptr<ICIMNamespace> const& ns) {
   try {
     TCIMReference(ns, "root/host:X_Nothing.Id=\"1\"", TCIMContext());
-  } catch (TZEPException const& failure) {
-    std::cout << failure.what() << ", as " << TRootObject::GetCoreLogger()->GetLog().back().fMessage << "\n";
+  } catch (TZEPFailure const& failure) {
+    std::cout << failure.what() << ": " << failure.Reason() << "\n";
   }
 }
 

@@ -17,7 +17,7 @@ public:
   // assertion.
   virtual void RegisterNamespaceProvider(boost::shared_ptr<INamespaceProvider> provider) = 0;
 
-  // Logs an error and throws kZEPStatusNotFound when no provider has that name.
+  // Logs an error and throws a TZEPFailure with kZEPStatusNotFound when no provider has that name.
   virtual boost::shared_ptr<INamespaceProvider> GetNamespaceProvider(std::string const& name) const = 0;
 
   // Visits the providers in byte order of their names, until a call returns false.

@@ -95,8 +95,8 @@ public:
   static bool createFile(std::string path, std::string contents);
 
   // Opens the stream on the file `path`, which is created or truncated; an open stream is closed first. A failure is logged
-  // as an error and throws kZEPStatusAccessDenied for EACCES, otherwise kZEPStatusFileSystemError, even if the stream's
-  // exception mask makes the stream itself throw. The mask does not change; after a failure the stream's state is failbit.
+  // as an error and throws TZEPFailure: kZEPStatusAccessDenied for EACCES, otherwise kZEPStatusFileSystemError, even if the
+  // stream's exception mask makes the stream throw. The mask does not change; after a failure the stream's state is failbit.
   static void OpenOutputFileStream(std::ofstream& stream, std::string path);
 
   // The working directory. Throws kZEPStatusFail when it cannot be determined or its path is longer than 1023 bytes.
@@ -219,7 +219,7 @@ public:
 
   // Everything from the current position of `fd` to the end of the file, zero bytes included. The descriptor stays open.
   // `path` is used in messages only. With `logContents` the complete text is logged at debug severity. A failing read is
-  // logged at status severity and throws kZEPStatusFileSystemError.
+  // logged at status severity and throws a TZEPFailure with kZEPStatusFileSystemError.
   static std::string GetFileContents(int fd, std::string path, bool logContents);
 
   // Copies the file into the working directory, or to "/" when that cannot be determined, and opens the copy in vi: the name
@@ -267,7 +267,7 @@ public:
   static std::string BuildSpecificationPath(std::string pluginPath);  // of the kind "pi"
 
   // Loads a plug-in and returns the dynamic linker's handle. All symbols are resolved at once and are visible to libraries
-  // loaded later. A failure is logged as an error with the linker's reason and throws kZEPStatusFileSystemError.
+  // loaded later. A failure is logged as an error and throws TZEPFailure (kZEPStatusFileSystemError) with the linker's reason.
   static void* LoadPluginLibrary(std::string path);
 
   // Loads "<root path>/lib<baseName>.nsp.so". The provider registers itself while it is loaded. Fails as LoadPluginLibrary
@@ -276,7 +276,7 @@ public:
 
   // Loads "<root path>/lib<baseName>.nsc.so" and returns the consumer that its function <baseName>_CreateINamespaceConsumer
   // creates; the caller owns the consumer. Fails as LoadPluginLibrary does; a missing function is logged as an error and
-  // throws kZEPStatusNotFound, and the library stays loaded.
+  // throws a TZEPFailure with kZEPStatusNotFound, and the library stays loaded.
   static INamespaceConsumer* LoadNSCLibrary(std::string baseName);
 
   // ---- Machine identification (TOSSpecificMachine.cpp) ----
@@ -345,11 +345,11 @@ public:
   // be deleted, it returns without a transfer and without an error. An empty download leaves no file. The received part of a
   // broken download stays. Kept.
   //
-  // Every failure is logged as an error. Throws kZEPStatusLibCurlFailure when libcurl cannot be loaded or set up, or the
-  // file to upload cannot be opened; kZEPStatusConnectionFailed when the host is unknown or cannot be connected to;
-  // kZEPStatusAccessDenied for any other failure of the transfer, including a full local disk and a file to upload that
-  // cannot be read to its end (a directory, a failing disk). The part of an upload that was sent before a failure stays on
-  // the server.
+  // Every failure is logged as an error and throws a TZEPFailure whose reason is that of the log line: with
+  // kZEPStatusLibCurlFailure when libcurl cannot be loaded or set up, or the file to upload cannot be opened; with
+  // kZEPStatusConnectionFailed when the host is unknown or cannot be connected to; with kZEPStatusAccessDenied for any other
+  // failure of the transfer, including a full local disk and a file to upload that cannot be read to its end (a directory, a
+  // failing disk). The part of an upload that was sent before a failure stays on the server.
   static void CurlTransferFile(std::string url, std::string localFile, bool download);
 
   // Upload the file to ftp://host/name or sftp://host/name. When the environment variable ZEP_ISBOOTABLE is exactly "yes",
@@ -368,7 +368,7 @@ public:
   // `userAndPassword` is "user:password"; the last argument is not used. Returns kZEPStatusOK when a response was received,
   // even if it is the proxy's refusal: examine the file. Kept. A failing fetch is logged as an error and returns
   // kZEPStatusConnectionFailed when the proxy is unknown or cannot be connected to, otherwise kZEPStatusAccessDenied. When
-  // libcurl cannot be loaded or set up, logs an error and throws kZEPStatusLibCurlFailure.
+  // libcurl cannot be loaded or set up, logs an error and throws a TZEPFailure with kZEPStatusLibCurlFailure.
   static TZEPStatusCode CheckProxySetting(std::string proxy, std::string port, std::string userAndPassword, long unused);
 
   // Returns 0 when the host name can be resolved and 1 when it cannot, despite the operation's name. Kept. The result is

@@ -46,5 +46,6 @@
 #include "TOSSpecific.h"
 #include "TRootObject.h"
 #include "TZEPException.h"
+#include "TZEPFailure.h"
 #include "TZEPStatusCode.h"
 #include "ZEPExport.h"

@@ -2,20 +2,22 @@
 #include "loaders/CurlLibrary.h"
 
 #include "TOSSpecific.h"
-#include "TZEPException.h"
-#include "core/Log.h"
+#include "core/Failure.h"
 
 namespace NQRVZEP20 {
 namespace {
+
+// The reason that the exception carries follows the operation's name in the message.
+[[noreturn]] void Throw(std::string_view message, std::string const& detail) {
+  std::size_t const reason = message.find(": ") + 2;
+  LogErrorAndThrow(kZEPStatusLibCurlFailure, message.substr(0, reason), std::string(message.substr(reason)) + detail);
+}
 
 // Ends the search at the first function that is missing, of which the linker tells.
 template <class TFunction>
 TFunction* FunctionOrThrow(void* library, char const* name, char const* message) {
   TFunction* const function = FunctionOf<TFunction>(library, name);
-  if (function == nullptr) {
-    LogError(message, LinkerReason());
-    throw TZEPException(kZEPStatusLibCurlFailure);
-  }
+  if (function == nullptr) Throw(message, LinkerReason());
   return function;
 }
 
@@ -35,8 +37,7 @@ TSharedLibrary TCurl::Open(char const* message) {
   for (std::string const& name : {root + "/libcurl.so", root + "/libcurl.so.4", std::string("libcurl.so"),
                                   std::string("libcurl.so.4"), std::string("libcurl.so.3"), std::string("libcurl.so.2")})
     if (TSharedLibrary library{::dlopen(name.c_str(), RTLD_LAZY)}) return library;
-  LogError(message, LinkerReason());
-  throw TZEPException(kZEPStatusLibCurlFailure);
+  Throw(message, LinkerReason());
 }
 
 TCurl::TFunctions TCurl::FunctionsOf(void* library, char const* message) {
@@ -53,9 +54,6 @@ TCurl::TGlobalState::TGlobalState(TFunctions const& functions) : fCleanup(functi
   functions.globalInit(CURL_GLOBAL_ALL);
 }
 
-void TCurl::Fail(char const* message) {
-  LogError(message);
-  throw TZEPException(kZEPStatusLibCurlFailure);
-}
+void TCurl::Fail(char const* message) { Throw(message, ""); }
 
 }  // namespace NQRVZEP20

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TOSSpecific.h"
 #include "TZEPException.h"
+#include "core/Failure.h"
 #include "core/Handles.h"
 #include "core/Log.h"
 #include "os/Directories.h"
@@ -203,9 +204,8 @@ void TOSSpecific::OpenOutputFileStream(std::ofstream& stream, std::string path) 
   stream.clear();
   stream.open(path);
   if (!stream.is_open()) {
-    int const error = errno;
-    LogError("TOSSpecific::OpenOutputFileStream --  Failed to open output file: ", path);
-    throw TZEPException(error == EACCES ? kZEPStatusAccessDenied : kZEPStatusFileSystemError);
+    EZEPStatusCode const code = errno == EACCES ? kZEPStatusAccessDenied : kZEPStatusFileSystemError;
+    LogErrorAndThrow(code, "TOSSpecific::OpenOutputFileStream --  ", "Failed to open output file: " + path);
   }
   LogDebug("TOSSpecific::OpenOutputFileStream -- Exting ");
 }

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TOSSpecific.h"
 #include "TZEPException.h"
+#include "core/Failure.h"
 #include "core/Handles.h"
-#include "core/Log.h"
 #include "os/Directories.h"
 
 #include <dlfcn.h>
@@ -121,33 +121,23 @@ std::string TOSSpecific::BuildSpecificationPath(std::string pluginPath) {
 
 void* TOSSpecific::LoadPluginLibrary(std::string path) {
   void* const library = Load(path);
-  if (library == nullptr) {
-    LogError("ERROR: Failed to load plugin.  Reason: ", LinkerReason());
-    throw TZEPException(kZEPStatusFileSystemError);
-  }
+  if (library == nullptr) LogErrorAndThrow(kZEPStatusFileSystemError, "ERROR: Failed to load plugin.  Reason: ", LinkerReason());
   return library;
 }
 
 void TOSSpecific::LoadNSPLibrary(std::string baseName) {
-  if (Load(GetZEPRootPath() + "/lib" + baseName + kNSPExtension) == nullptr) {
-    LogError("Couldn't load NSP: ", baseName, " (", LinkerReason(), ")");
-    throw TZEPException(kZEPStatusFileSystemError);
-  }
+  if (Load(GetZEPRootPath() + "/lib" + baseName + kNSPExtension) == nullptr)
+    LogErrorAndThrow(kZEPStatusFileSystemError, "Couldn't load NSP: " + baseName + " (", LinkerReason(), ")");
 }
 
 INamespaceConsumer* TOSSpecific::LoadNSCLibrary(std::string baseName) {
   std::string const path = GetZEPRootPath() + "/lib" + baseName + ".nsc.so";
   void* const library = Load(path);
-  if (library == nullptr) {
-    LogError("Couldn't load NSC: ", baseName, " (", LinkerReason(), ")");
-    throw TZEPException(kZEPStatusFileSystemError);
-  }
+  if (library == nullptr)
+    LogErrorAndThrow(kZEPStatusFileSystemError, "Couldn't load NSC: " + baseName + " (", LinkerReason(), ")");
 
   auto* const createConsumer = FunctionOf<INamespaceConsumer*()>(library, (baseName + "_CreateINamespaceConsumer").c_str());
-  if (createConsumer == nullptr) {
-    LogError("Couldn't find 'CreateINamespaceConsumer' in ", path);
-    throw TZEPException(kZEPStatusNotFound);
-  }
+  if (createConsumer == nullptr) LogErrorAndThrow(kZEPStatusNotFound, "", "Couldn't find 'CreateINamespaceConsumer' in " + path);
   return createConsumer();
 }
 

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TOSSpecific.h"
 #include "TZEPException.h"
+#include "core/Failure.h"
 #include "core/Handles.h"
 #include "core/Log.h"
 
@@ -133,10 +134,7 @@ pid_t StartChildOrThrow(TProgram const& program, TPipe const& pipe) {
   TSignalsHeldBack const signals;
   pid_t const child = ::vfork();
   if (child == 0) ExecInChild(program, pipe.fReadEnd.get(), pipe.fWriteEnd.get(), signals.OldMask());
-  if (child < 0) {
-    LogError("ERROR: Fork failed");
-    throw TZEPException(kZEPStatusFail);
-  }
+  if (child < 0) LogErrorAndThrow(kZEPStatusFail, "ERROR: ", "Fork failed");
   return child;
 }
 
@@ -292,10 +290,7 @@ void TOSSpecific::CapFileViaProc(std::string program, std::vector<std::string> a
 
 std::string TOSSpecific::CaptureFile(std::string path) {
   TUniqueFd const file(::open(path.c_str(), O_RDONLY));
-  if (!file) {
-    LogError("ERROR: CaptureFile failed to open: ", path);
-    throw TZEPException(kZEPStatusFileNotFound);
-  }
+  if (!file) LogErrorAndThrow(kZEPStatusFileNotFound, "ERROR: CaptureFile ", "failed to open: " + path);
   return GetFileContents(file.get(), path, true);
 }
 
@@ -314,10 +309,7 @@ std::string TOSSpecific::GetFileContents(int fd, std::string path, bool logConte
   std::vector<char> buffer(MakeRoomFor(fd, contents));
   ssize_t got;
   while ((got = ::read(fd, buffer.data(), buffer.size())) > 0) contents.append(buffer.data(), static_cast<std::size_t>(got));
-  if (got < 0) {
-    LogStatus("GetFileContents failed to read file ", path);
-    throw TZEPException(kZEPStatusFileSystemError);
-  }
+  if (got < 0) LogAndThrow(ILogger::kLogStatus, kZEPStatusFileSystemError, "GetFileContents ", "failed to read file " + path);
   if (logContents) LogDebug("Debug (linux toss): GetFileContents() Returned: ", contents);
   return contents;
 }

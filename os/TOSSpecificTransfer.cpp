@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TOSSpecific.h"
-#include "TZEPException.h"
+#include "core/Failure.h"
 #include "core/Handles.h"
-#include "core/Log.h"
-#include "loaders/CurlLibrary.h"
+#include "os/ProxyCheck.h"
+#include "os/WriteContext.h"
 
 #include <fcntl.h>
 #include <netdb.h>
@@ -15,14 +15,11 @@
 namespace NQRVZEP20 {
 namespace {
 
+constexpr char kTransfer[] = "TOSSpecific|CurlTransferFile: ";  // before the reason, in a line of the log
+
 constexpr TCurlMessages kTransferMessages = {
     "TOSSpecific|CurlTransferFile: Error opening curl library: ", "TOSSpecific|CurlTransferFile: Error loading curl library: ",
     "TOSSpecific|CurlTransferFile: Error initalizing curl", "TOSSpecific|CurlTransferFile: Error configuring curl error buffer"};
-
-constexpr TCurlMessages kProxyMessages = {
-    "TOSSpecific|CheckProxySetting: Error opening curl library: ", "TOSSpecific|CheckProxySetting: Error loading curl library: ",
-    "TOSSpecific|CheckProxySetting: Error initalizing curl",
-    "TOSSpecific|CheckProxySetting: Error configuring curl error buffer"};
 
 constexpr unsigned long kRefused = 0xFFFFFFFF;  // no chunk is as long, so libcurl stops
 
@@ -51,29 +48,19 @@ bool MakeWayFor(std::string const& path) {
   return false;
 }
 
-void SetWriteContext(TCurl& curl, TCurlWriteContext& context) {
-  constexpr char const* kMessage = "TOSSpecific|CurlTransferFile: Error setting curl write function";
-  curl.Set(CURLOPT_WRITEFUNCTION, &curl_fwrite, kMessage);
-  curl.Set(CURLOPT_WRITEDATA, &context, kMessage);
-}
-
 // ---- Uploads ----
 
 void CheckStatusOf(std::string const& path) {
   TUniqueFd const file(::open(path.c_str(), O_RDONLY));
   struct stat status;
   if (file && ::fstat(file.get(), &status) == 0) return;
-  LogError("TOSSpecific|CurlTransferFile: Error getting file size");
-  throw TZEPException(kZEPStatusLibCurlFailure);
+  LogErrorAndThrow(kZEPStatusLibCurlFailure, kTransfer, "Error getting file size");
 }
 
 TUniqueFile OpenForUpload(std::string const& path) {
   CheckStatusOf(path);
   TUniqueFile stream(std::fopen(path.c_str(), "rb"));
-  if (!stream) {
-    LogError("TOSSpecific|CurlTransferFile: Error creating file stream");
-    throw TZEPException(kZEPStatusLibCurlFailure);
-  }
+  if (!stream) LogErrorAndThrow(kZEPStatusLibCurlFailure, kTransfer, "Error creating file stream");
   return stream;
 }
 
@@ -92,12 +79,9 @@ void CreateMissingDirectories(TCurl& curl) {
 void PerformTransfer(TCurl& curl) {
   CURLcode const result = curl.Perform();
   if (result == CURLE_OK) return;
-  if (result == CURLE_COULDNT_RESOLVE_HOST || result == CURLE_COULDNT_CONNECT) {
-    LogError("TOSSpecific|CurlTransferFile: Error connecting to Server");
-    throw TZEPException(kZEPStatusConnectionFailed);
-  }
-  LogError("TOSSpecific|CurlTransferFile: Error performing command: ", curl.ErrorText());
-  throw TZEPException(kZEPStatusAccessDenied);
+  if (result == CURLE_COULDNT_RESOLVE_HOST || result == CURLE_COULDNT_CONNECT)
+    LogErrorAndThrow(kZEPStatusConnectionFailed, kTransfer, "Error connecting to Server");
+  LogErrorAndThrow(kZEPStatusAccessDenied, kTransfer, std::string("Error performing command: ") + curl.ErrorText());
 }
 
 void Download(TCurl& curl, std::string const& url, std::string const& localFile) {
@@ -112,8 +96,7 @@ void Download(TCurl& curl, std::string const& url, std::string const& localFile)
 // libcurl takes a read that fails for the end of the file: what arrived is cut off there.
 void CheckWasReadToItsEnd(std::FILE* stream) {
   if (std::ferror(stream) == 0) return;
-  LogError("TOSSpecific|CurlTransferFile: Error performing command: the local file cannot be read to its end");
-  throw TZEPException(kZEPStatusAccessDenied);
+  LogErrorAndThrow(kZEPStatusAccessDenied, kTransfer, "Error performing command: the local file cannot be read to its end");
 }
 
 void Upload(TCurl& curl, std::string const& url, TUniqueFile& stream, std::string const& localFile) {
@@ -182,19 +165,7 @@ void TOSSpecific::UserFTPFile(std::string host, std::string localFile, std::stri
 }
 
 TZEPStatusCode TOSSpecific::CheckProxySetting(std::string proxy, std::string port, std::string userAndPassword, long) {
-  TCurlWriteContext page{"./content.html", nullptr};
-  TCurl curl(kProxyMessages);
-  curl.Set(CURLOPT_PROXY, proxy.c_str(), "TOSSpecific|CheckProxySetting: Error setting proxyIp");
-  curl.Set(CURLOPT_PROXYPORT, std::atol(port.c_str()), "TOSSpecific|CheckProxySetting: Error setting proxyPort");
-  curl.Set(CURLOPT_URL, ZEP_PROXY_CHECK_PAGE, "TOSSpecific|CheckProxySetting: Error setting URL");
-  SetWriteContext(curl, page);  // which complains in the name of CurlTransferFile. Kept.
-  curl.Set(CURLOPT_PROXYUSERPWD, userAndPassword.c_str(), "TOSSpecific|CheckProxySetting: Error setting userId & passwd");
-
-  CURLcode const result = curl.Perform();
-  if (result == CURLE_OK) return kZEPStatusOK;
-  LogError("TOSSpecific|CheckProxySetting: curl_easy_perform FAILed;", curl.ErrorText());
-  if (result == CURLE_COULDNT_RESOLVE_PROXY || result == CURLE_COULDNT_CONNECT) return kZEPStatusConnectionFailed;
-  return kZEPStatusAccessDenied;
+  return CheckProxy(proxy, port, userAndPassword).fStatus;
 }
 
 int TOSSpecific::DetectHostnameAvailable(std::string hostName, std::string) {

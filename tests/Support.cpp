@@ -56,6 +56,19 @@ std::string ReadFile(std::string const& path) {
 
 void WriteFile(std::string const& path, std::string const& text) { std::ofstream(path, std::ios::binary) << text; }
 
+std::string ReasonOf(std::function<void()> const& function) {
+  try {
+    function();
+  } catch (TZEPFailure const& failure) {
+    return failure.Reason();
+  } catch (TZEPException const& failure) {
+    ADD_FAILURE() << failure.what() << " has no reason";
+    return "";
+  }
+  ADD_FAILURE() << "nothing was thrown";
+  return "";
+}
+
 std::vector<std::string> LoggedMessages() {
   std::vector<std::string> messages;
   for (auto const& entry : TRootObject::GetCoreLogger()->GetLog()) messages.push_back(entry.fMessage);

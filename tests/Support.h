@@ -7,6 +7,7 @@
 #include "TLogger.h"
 #include "TRootObject.h"
 #include "TZEPException.h"
+#include "TZEPFailure.h"
 #include "TestPaths.h"
 
 #include <gtest/gtest.h>
@@ -92,6 +93,9 @@ private:
 
 std::string ReadFile(std::string const& path);
 void WriteFile(std::string const& path, std::string const& text);
+
+// The reason of the TZEPFailure that the function throws. It fails the test when nothing or something else is thrown.
+std::string ReasonOf(std::function<void()> const& function);
 
 // The messages that the in-memory log holds (severities up to Status), oldest first.
 std::vector<std::string> LoggedMessages();

@@ -18,8 +18,7 @@
 #include "INamespaceProvider.h"
 #include "INamespaceProviderManager.h"
 #include "TCIMReference.h"
-#include "TZEPException.h"
-#include "core/Log.h"
+#include "core/Failure.h"
 
 #include <boost/core/demangle.hpp>
 
@@ -48,8 +47,7 @@ namespace {
 
 // `implementer`: the class of the plug-in's object. `operation`: "ICIMClass::CommitInstance".
 [[noreturn]] void ThrowNotImplemented(std::type_info const& implementer, char const* operation) {
-  LogError(boost::core::demangle(implementer.name()), " does not implement ", operation);
-  throw TZEPException(kZEPStatusNotImplemented);
+  LogErrorAndThrow(kZEPStatusNotImplemented, "", boost::core::demangle(implementer.name()) + " does not implement " + operation);
 }
 
 }  // namespace

@@ -23,7 +23,7 @@ constexpr bool kPlainClasses = false, kAssociations = true;
 
 // The class of that name. A namespace may answer an unknown name with an empty pointer, too.
 boost::shared_ptr<ICIMClass> ClassIn(ICIMNamespace const& dst, std::string const& name) {
-  return Required(dst.GetClass(name, TCIMContext()));
+  return Required(dst.GetClass(name, TCIMContext()), "class", name);
 }
 
 boost::shared_ptr<ICIMClass> SuperClassIn(ICIMNamespace const& dst, ICIMClass const& cls) {
@@ -89,7 +89,8 @@ void TCIMCopy::CopyClasses(boost::shared_ptr<ICIMNamespace> src, boost::shared_p
 
 void TCIMCopy::CopyClass(boost::shared_ptr<ICIMClass> cls, boost::shared_ptr<ICIMNamespace> dst) {
   boost::shared_ptr<ICIMClass> const superClass = SuperClassIn(*dst, *cls);
-  boost::shared_ptr<ICIMClass> const copy = Required(dst->CreateClass(superClass, cls->GetName(TCIMContext()), TCIMContext()));
+  std::string const name = cls->GetName(TCIMContext());
+  boost::shared_ptr<ICIMClass> const copy = Required(dst->CreateClass(superClass, name, TCIMContext()), "class", name);
   cls->EnumerateQualifiers(TCopyQualifier(dst, copy), TCIMContext());
   CopyPropertyDecls(*cls, copy, dst);
   cls->EnumerateStaticProperties(TCopyStaticProperty(dst, copy), TCIMContext());
@@ -100,7 +101,7 @@ void TCIMCopy::CopyInstance(boost::shared_ptr<ICIMInstance> inst, boost::shared_
   boost::recursive_mutex::scoped_lock const lock(copyInstMutex);
   std::string const className = inst->GetClass(TCIMContext())->GetName(TCIMContext());
   boost::shared_ptr<ICIMClass> const cls = ClassIn(*dst, className);
-  boost::shared_ptr<ICIMInstance> const copy = Required(cls->CreateInstance(TCIMContext()));
+  boost::shared_ptr<ICIMInstance> const copy = Required(cls->CreateInstance(TCIMContext()), "instance of", className);
   inst->EnumerateProperties(TCopyInstanceProperty(dst, copy), TCIMContext());
   cls->CommitInstance(copy, TCIMContext());
 }

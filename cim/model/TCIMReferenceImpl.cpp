@@ -6,7 +6,7 @@
 #include "ICIMNamespace.h"
 #include "ICIMPropertyDecl.h"
 #include "TZEPException.h"
-#include "core/Log.h"
+#include "core/Failure.h"
 
 #include <algorithm>
 #include <sstream>
@@ -19,8 +19,7 @@ constexpr std::size_t kNowhere = std::string::npos;
 constexpr int kMaxDepth = 100;  // nesting of references in keys; limited because paths are foreign input
 
 [[noreturn]] void ThrowInvalidReference(std::string_view reason, std::string const& path) {
-  LogError(reason, path);
-  throw TZEPException(kZEPStatusInvalidReference);
+  LogErrorAndThrow(kZEPStatusInvalidReference, "", std::string(reason) + path);
 }
 
 // The "." between class and keys. Only a "." after a ":" counts, so a path without a namespace prefix has no keys. Kept.
@@ -86,7 +85,7 @@ bool AreKeysLess(TKeyBindings const& a, TKeyBindings const& b) {
 
 std::string TypeMismatchText(TCIMValue::TCIMType declared, TCIMValue::TCIMType given) {
   std::ostringstream text;
-  text << "Core: Declaration type: " << declared << " Value type: " << given;
+  text << "Declaration type: " << declared << " Value type: " << given;
   return text.str();
 }
 
@@ -217,10 +216,8 @@ void TCIMReferenceImpl::LookUpClass(ICIMNamespace const& ns, std::string const& 
 void TCIMReferenceImpl::AddKeyValue(std::string const& name, TCIMValue const& value) {
   if (!fClass) throw TZEPException(kZEPStatusInvalidOpSequence);
   TCIMValue::TCIMType const declared = GetDeclaration(*fClass, name)->GetType(TCIMContext());
-  if (declared != value.GetType()) {
-    LogError(TypeMismatchText(declared, value.GetType()));
-    throw TZEPException(kZEPStatusTypeMismatch);
-  }
+  if (declared != value.GetType())
+    LogErrorAndThrow(kZEPStatusTypeMismatch, "Core: ", TypeMismatchText(declared, value.GetType()));
   AddKey(std::string(name), TCIMValue(value));
 }
 

@@ -7,6 +7,7 @@
 #include "ICIMProperty.h"
 #include "TAddToVectorCallback.h"
 #include "TZEPException.h"
+#include "core/Failure.h"
 #include "core/Log.h"
 
 #include <algorithm>
@@ -81,25 +82,22 @@ std::string ReadOnlyInstance(ICIMNamespace const& ns, std::string const& classNa
   return property->GetValue(context);
 }
 
-template <class... TPieces>
-[[noreturn]] void ThrowNotFound(TPieces const&... reason) {
-  LogDebug(reason...);
-  throw TZEPException(kZEPStatusNotFound);
+[[noreturn]] void ThrowNotFound(std::string const& reason) {
+  LogAndThrow(ILogger::kLogDebug, kZEPStatusNotFound, "TCIMSchemaHelper: ", reason);
 }
 
 // Reads a property of the computer system in the same way, but logs each failure, and treats a value that is NULL or not a
 // string as missing.
 std::string ReadComputerSystem(ICIMNamespace const& ns, std::string const& propertyName, TCIMContext const& context) {
   auto const cls = FindClass(ns, TCIMSchemaHelper::kSystemCreationClassName, context);
-  if (!cls) ThrowNotFound("TCIMSchemaHelper: no computer system");
+  if (!cls) ThrowNotFound("no computer system");
   TInstances const instances = InstancesOf(*cls, context);
-  if (instances.size() != 1) ThrowNotFound("TCIMSchemaHelper: computer system instances != 1");
+  if (instances.size() != 1) ThrowNotFound("computer system instances != 1");
   auto const property = FindProperty(*instances.front(), propertyName, context);
-  if (!property) ThrowNotFound("TCIMSchemaHelper: didn't find ", propertyName, " property");
+  if (!property) ThrowNotFound("didn't find " + propertyName + " property");
   TCIMValue const value = property->GetValue(context);
-  if (value.IsNull()) ThrowNotFound("TCIMSchemaHelper: ", propertyName, " is NULL");
-  if (value.GetType() != TCIMValue::TCIMType::kCIMTypeString)
-    ThrowNotFound("TCIMSchemaHelper: ", propertyName, " wasn't a string");
+  if (value.IsNull()) ThrowNotFound(propertyName + " is NULL");
+  if (value.GetType() != TCIMValue::TCIMType::kCIMTypeString) ThrowNotFound(propertyName + " wasn't a string");
   return value;
 }
 
@@ -294,7 +292,10 @@ std::string TCIMSchemaHelper::GetSerialNumber(boost::shared_ptr<ICIMNamespace> n
 std::string TCIMSchemaHelper::GetDataSourceMajorVersion(boost::shared_ptr<ICIMNamespace> ns, TCIMContext context) {
   std::string const version = GetDataSourceVersion(ns, std::move(context));
   std::size_t const dot = version.find('.');
-  if (dot == std::string::npos) ThrowNotFound("TCIMSchemaHelper::GetDataSourceMajorVersion - Throwing");
+  if (dot == std::string::npos) {
+    LogDebug("TCIMSchemaHelper::GetDataSourceMajorVersion - Throwing");
+    throw TZEPException(kZEPStatusNotFound);
+  }
   return version.substr(0, dot);
 }
 

@@ -75,7 +75,7 @@ bool TCopyQualifierDecls::operator()(boost::shared_ptr<ICIMQualifierDecl> declar
   TCIMValue const defaultValue = TypedDefault(declaration->GetType(none), declaration->GetDefaultValue(none));
   unsigned int const scope = declaration->GetScope(none);
   unsigned int const flavor = declaration->GetFlavor(none);
-  Required(Lock(fDestination)->CreateQualifierDecl(name, defaultValue, scope, flavor, none));
+  Required(Lock(fDestination)->CreateQualifierDecl(name, defaultValue, scope, flavor, none), "qualifier declaration", name);
   return true;
 }
 
@@ -113,9 +113,10 @@ TCopyQualifier::TCopyQualifier(boost::weak_ptr<ICIMNamespace> destination, boost
 
 bool TCopyQualifier::operator()(boost::shared_ptr<ICIMQualifier> qualifier) {
   TCIMContext const none;
+  std::string const name = qualifier->GetName(none);
   boost::shared_ptr<ICIMQualifierDecl> const declaration =
-      Required(Lock(fDestination)->GetQualifierDecl(qualifier->GetName(none), none));
-  Required(fTarget->AddQualifier(declaration, qualifier->GetValue(none), qualifier->GetFlavor(none), none));
+      Required(Lock(fDestination)->GetQualifierDecl(name, none), "qualifier declaration", name);
+  Required(fTarget->AddQualifier(declaration, qualifier->GetValue(none), qualifier->GetFlavor(none), none), "qualifier", name);
   return true;
 }
 
@@ -139,7 +140,8 @@ void TCopyPropertyDecl::Copy(ICIMPropertyDecl const& declaration) {
   declaration.GetQualifier(kOverrideQualifier, none);
 
   TCIMValue const defaultValue = TCIMCopy::CopyValue(declaration.GetDefaultValue(none), Lock(fDestination));
-  boost::shared_ptr<ICIMPropertyDecl> const copy = Required(fTarget->AddPropertyDecl(name, defaultValue, none));
+  boost::shared_ptr<ICIMPropertyDecl> const copy =
+      Required(fTarget->AddPropertyDecl(name, defaultValue, none), "property declaration", name);
   CopyQualifiers(declaration, fDestination, copy);
 }
 
@@ -158,8 +160,9 @@ TCopyMethodDecl::TCopyMethodDecl(boost::weak_ptr<ICIMNamespace> destination, boo
 
 bool TCopyMethodDecl::operator()(boost::shared_ptr<ICIMMethodDecl> declaration) {
   TCIMContext const none;
+  std::string const name = declaration->GetName(none);
   boost::shared_ptr<ICIMMethodDecl> const copy =
-      Required(fTarget->AddMethodDecl(declaration->GetName(none), declaration->GetReturnType(none), none));
+      Required(fTarget->AddMethodDecl(name, declaration->GetReturnType(none), none), "method declaration", name);
   CopyQualifiers(*declaration, fDestination, copy);
   TCopyParameterDecl copyParameter(fDestination, copy);
   declaration->EnumerateParameterDecls(boost::ref(copyParameter), none);
@@ -171,9 +174,11 @@ TCopyParameterDecl::TCopyParameterDecl(boost::weak_ptr<ICIMNamespace> destinatio
 
 bool TCopyParameterDecl::operator()(boost::shared_ptr<ICIMParameterDecl> declaration) {
   TCIMContext const none;
+  std::string const name = declaration->GetName(none);
   boost::shared_ptr<ICIMParameterDecl> const copy =
-      Required(fTarget->AddParameterDecl(declaration->GetName(none), declaration->GetType(none),
-                                         declaration->GetMaxArraySize(none), declaration->GetReferencedClassName(none), none));
+      Required(fTarget->AddParameterDecl(name, declaration->GetType(none), declaration->GetMaxArraySize(none),
+                                         declaration->GetReferencedClassName(none), none),
+               "parameter declaration", name);
   CopyQualifiers(*declaration, fDestination, copy);
   return true;
 }
@@ -187,7 +192,8 @@ bool TCopyInstanceProperty::operator()(boost::shared_ptr<ICIMProperty> property)
   TCIMContext const none;
   TCIMValue const value = property->GetValue(none);
   if (value.IsNull()) return true;
-  boost::shared_ptr<ICIMProperty> const copy = Required(fTarget->GetProperty(property->GetName(none), none));
+  std::string const name = property->GetName(none);
+  boost::shared_ptr<ICIMProperty> const copy = Required(fTarget->GetProperty(name, none), "property", name);
   copy->SetValue(TCIMCopy::CopyValue(value, Lock(fDestination)), none);
   return true;
 }

@@ -1,8 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TNamespaceProviderManager.h"
 
-#include "TZEPException.h"
-#include "core/Log.h"
+#include "core/Failure.h"
 
 #include <boost/make_shared.hpp>
 
@@ -36,10 +35,7 @@ void TNamespaceProviderManager::RegisterNamespaceProvider(boost::shared_ptr<INam
 
 boost::shared_ptr<INamespaceProvider> TNamespaceProviderManager::GetNamespaceProvider(std::string const& name) const {
   auto const found = fProviders.find(name);
-  if (found == fProviders.end()) {
-    LogError("Failed to find nsp named ", name);
-    throw TZEPException(kZEPStatusNotFound);
-  }
+  if (found == fProviders.end()) LogErrorAndThrow(kZEPStatusNotFound, "", "Failed to find nsp named " + name);
   return found->second;
 }
 

@@ -3,7 +3,7 @@
 
 #include "cim/value/ReadNumber.h"
 #include "cim/value/ScalarTypes.h"
-#include "core/Log.h"
+#include "core/Failure.h"
 
 #include <array>
 #include <cctype>
@@ -37,9 +37,9 @@ TType ElementOf(TType type) { return TType::ECIMType(type & ~TType::kCIMTypeArra
 void RequireElementsOf(TType type, std::vector<TCIMValue> const& elements) {
   for (TCIMValue const& element : elements) {
     if (element.GetType() == type) continue;
-    LogError("Core: ERROR: Attempting to create array of type ", type.ToString(), ", but element is of type ",
-             element.GetType().ToString(), ".");
-    throw TZEPException(kZEPStatusInvalidProperty);
+    LogErrorAndThrow(kZEPStatusInvalidProperty, "Core: ERROR: ",
+                     "Attempting to create array of type " + type.ToString() + ", but element is of type " +
+                         element.GetType().ToString() + ".");
   }
 }
 

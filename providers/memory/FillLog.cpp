@@ -3,12 +3,15 @@
 
 #include "ILogger.h"
 #include "TRootObject.h"
+#include "TZEPFailure.h"
 
 namespace NQRVZEP20 {
 
-void LogRefusal(std::string const& className, std::string const& member, TZEPException const& reason) {
-  std::string const element = member.empty() ? className : className + "." + member;
-  TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, element + " refused: " + reason.what());
+void ThrowRefusal(std::string const& className, std::string const& member, TZEPException const& cause) {
+  std::string const refused = member.empty() ? className : className + "." + member;
+  std::string const reason = refused + " refused: " + cause.what();
+  TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, reason);
+  throw TZEPFailure(cause.GetStatusCode(), reason);
 }
 
 }  // namespace NQRVZEP20

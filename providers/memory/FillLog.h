@@ -7,18 +7,17 @@
 
 namespace NQRVZEP20 {
 
-// Logs an error such as "X_Disk.Id refused: kZEPStatusTypeMismatch", because an exception does not contain the place. `member` is
-// empty when the class itself was refused.
-void LogRefusal(std::string const& className, std::string const& member, TZEPException const& reason);
+// Logs "X_Disk.Id refused: kZEPStatusTypeMismatch" as an error and throws a TZEPFailure with the code of `cause` and that line
+// as its reason. `member` is empty when the refusal concerns the class itself.
+[[noreturn]] void ThrowRefusal(std::string const& className, std::string const& member, TZEPException const& cause);
 
-// Runs one step of filling a namespace. When the step throws, the refused class and member are logged.
+// Runs one step of filling a namespace. A TZEPException that it throws becomes a refusal (ThrowRefusal).
 template <class TStep>
 auto NameRefusal(std::string const& className, std::string const& member, TStep const& step) {
   try {
     return step();
-  } catch (TZEPException const& reason) {
-    LogRefusal(className, member, reason);
-    throw;
+  } catch (TZEPException const& cause) {
+    ThrowRefusal(className, member, cause);
   }
 }
 

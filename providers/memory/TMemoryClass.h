@@ -57,7 +57,8 @@ public:
 
   // ---- Filling ----
 
-  // Creates an instance, sets the values and commits it. A refused value is logged as an error before the exception passes on.
+  // Creates an instance, sets the values and commits it. A refusal is logged as an error and throws a TZEPFailure whose
+  // reason names what was refused.
   boost::shared_ptr<TMemoryInstance> AddInstance(TMemoryValues const& values);
 
   // ---- For the other classes of this library ----

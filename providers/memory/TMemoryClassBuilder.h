@@ -24,7 +24,7 @@ class TMemoryClass;
 //       .Property("State", "uint16").ValueMap({"0", "1"}, {"Unknown", "Ready"})
 //       .Method("Reset", "uint32").In("Force", "boolean").Out("Log", "string[]");
 //
-// A refused element is logged as an error before the exception passes on; the elements before it remain.
+// A refusal is logged as an error and throws a TZEPFailure whose reason names what was refused. Earlier descriptions stay.
 class TMemoryClassBuilder {
 public:
   explicit TMemoryClassBuilder(boost::shared_ptr<TMemoryClass> cls);

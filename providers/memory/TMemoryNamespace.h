@@ -52,7 +52,7 @@ public:
   // never found; a class may have several such instances.
   boost::shared_ptr<ICIMInstance> GetInstance(TCIMReference const& path, TCIMContext const& context) const override;
 
-  // ---- Filling. A refused element is logged as an error before the exception passes on. ----
+  // ---- Filling. A refusal is logged as an error and throws a TZEPFailure whose reason names what was refused. ----
 
   // Creates a class, below `superClassName` unless that is empty, and returns a builder that describes it. The first call
   // declares the standard qualifiers. Throws everything that CreateClass throws, and kZEPStatusNotFound for a missing superclass.

@@ -555,6 +555,12 @@ TEST_F(FilesTest, StreamThatCannotBeOpenedThrows) {
             "threw kZEPStatusAccessDenied");
 }
 
+TEST_F(FilesTest, ReasonOfAStreamThatCannotBeOpenedTravelsWithTheFailure) {
+  std::ofstream stream;
+  std::string const path = fDir.Path("missing/file");
+  EXPECT_EQ(ReasonOf([&] { TOSSpecific::OpenOutputFileStream(stream, path); }), "Failed to open output file: " + path);
+}
+
 TEST_F(FilesTest, StreamThatThrowsByItselfFailsWithTheStatusAndKeepsItsMask) {
   constexpr std::ios::iostate kMasks[] = {std::ios::failbit, std::ios::badbit, std::ios::failbit | std::ios::badbit,
                                           std::ios::failbit | std::ios::badbit | std::ios::eofbit};

@@ -2,7 +2,7 @@
 #include "TOSSpecific.h"
 
 #include "TLogger.h"
-#include "tests/Support.h"
+#include "tests/LogOf.h"
 #include "tests/os/Programs.h"
 #include "tests/os/Unprivileged.h"
 
@@ -378,6 +378,30 @@ TEST(LoadPluginLibraryTest, LogsTheLinkersReasonAsAnError) {
     EXPECT_THAT(log.Entries(), ElementsAre("[Error] ERROR: Failed to load plugin.  Reason: " + dir.Path("libA.pi.so") +
                                            ": cannot open shared object file: No such file or directory"));
   });
+  TLogger().ClearLog();
+}
+
+TEST(LoadPluginLibraryTest, LinkersReasonTravelsWithTheFailure) {
+  TTempDir const dir;
+  auto const missing = [](std::string const& file) {
+    return file + ": cannot open shared object file: No such file or directory";
+  };
+  std::string const root = TOSSpecific::GetZEPRootPath();
+  struct {
+    std::function<void()> load;
+    std::string reason, line;
+  } const rows[] = {
+      {[&] { TOSSpecific::LoadPluginLibrary(dir.Path("libA.pi.so")); }, missing(dir.Path("libA.pi.so")),
+       "[Error] ERROR: Failed to load plugin.  Reason: " + missing(dir.Path("libA.pi.so"))},
+      {[] { TOSSpecific::LoadNSPLibrary("Nothing"); }, missing(root + "/libNothing.nsp.so"),
+       "[Error] Couldn't load NSP: Nothing (" + missing(root + "/libNothing.nsp.so") + ")"},
+      {[] { TOSSpecific::LoadNSCLibrary("Nothing"); }, missing(root + "/libNothing.nsc.so"),
+       "[Error] Couldn't load NSC: Nothing (" + missing(root + "/libNothing.nsc.so") + ")"},
+  };
+  for (auto const& row : rows) {
+    SCOPED_TRACE(row.line);
+    EXPECT_THAT(LogOf([&] { EXPECT_EQ(ReasonOf(row.load), row.reason); }), ElementsAre(row.line));
+  }
   TLogger().ClearLog();
 }
 

@@ -3,6 +3,7 @@
 // File transfer with a stand-in for libcurl (tests/os/curl): which options are set, in which order and to what, and what
 // becomes of each failure. Real servers: tests/system/transfer.
 
+#include "os/ProxyCheck.h"
 #include "tests/os/HostTools.h"
 #include "tests/os/Programs.h"
 #include "tests/os/curl/StandInCurl.h"
@@ -61,6 +62,11 @@ TLines Joined(TLines a, TLines const& b, TLines const& c) {
   a.insert(a.end(), b.begin(), b.end());
   a.insert(a.end(), c.begin(), c.end());
   return a;
+}
+
+// Expects that the work throws that reason, and that the line that it logs consists of the operation's name and the reason.
+void ExpectReason(std::function<void()> const& work, std::string const& operation, std::string const& reason) {
+  EXPECT_THAT(LogOf([&] { EXPECT_EQ(ReasonOf(work), reason); }), ElementsAre("[Error] " + operation + reason));
 }
 
 class TransferTest : public testing::Test {
@@ -417,6 +423,34 @@ std::string Repeated(std::string const& text, int times) {
   return all;
 }
 
+TEST_F(TransferTest, ReasonTravelsWithTheFailureWithoutTheOperationsName) {
+  struct TRow {
+    int result;
+    std::string text, reason;
+  };
+  std::string const operation = "TOSSpecific|CurlTransferFile: ";
+  for (TRow const& row : {TRow{6, "Could not resolve host: h", "Error connecting to Server"},
+                          TRow{67, "Access denied: 530", "Error performing command: Access denied: 530"},
+                          TRow{67, "", "Error performing command: "}}) {
+    SCOPED_TRACE(row.reason);
+    TCurlRecord record;
+    record.result = row.result;
+    record.errorText = row.text;
+    WithStandIn(record,
+                [&] { ExpectReason([&] { TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true); }, operation, row.reason); });
+  }
+  WithStandIn(fRecord, [&] {
+    ExpectReason([&] { TOSSpecific::CurlTransferFile("ftp://h/f", fDir.Path("missing"), false); }, operation,
+                 "Error getting file size");
+  });
+  fRecord.refusedOption = 10002;  // CURLOPT_URL
+  WithStandIn(fRecord, [&] {
+    ExpectReason([&] { TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true); }, operation, "Error setting curl target");
+    ExpectReason([&] { TOSSpecific::CheckProxySetting("p", "1", "u:p", 0); },
+                 "TOSSpecific|CheckProxySetting: ", "Error setting URL");
+  });
+}
+
 TEST_F(TransferTest, ALocalFileIsOverwrittenWhenTheAnswerIsY) {
   struct TRow {
     char const* input;
@@ -588,6 +622,18 @@ TEST_F(ProxyCheckTest, AFailedPerformIsLoggedAndReturned) {
     WithStandIn(record, [&] { log = LogOf([&] { EXPECT_EQ(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), row.status); }); });
     EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CheckProxySetting: curl_easy_perform FAILed;the reason"));
     EXPECT_EQ(TLines(record.calls.end() - 3, record.calls.end()), Joined({"perform"}, kEnd, {}));
+  }
+}
+
+TEST_F(ProxyCheckTest, LibcurlsTextTravelsWithTheStatus) {
+  for (std::string const reason : {"Received HTTP code 403 from proxy after CONNECT", ""}) {
+    TCurlRecord record;
+    record.result = 56;
+    record.errorText = reason;
+    TProxyAnswer answer;
+    WithStandIn(record, [&] { answer = CheckProxy("p", "1", "u:p"); });
+    EXPECT_EQ(answer.fStatus, kZEPStatusAccessDenied);
+    EXPECT_EQ(answer.fReason, reason);
   }
 }
 

@@ -22,7 +22,7 @@ status=0
 [[ $status == 0 || $status == 2 ]] || { echo "the installed zep ended with $status" >&2; exit 1; }
 grep -q SAMPLE "$work/report"
 
-expected=$(printf '%s\nQRVSG_ComputerSystem\nkZEPStatusFail' "$private")
+expected=$(printf '%s\nQRVSG_ComputerSystem\nkZEPStatusFail\nkZEPStatusNotFound: Failed to find nsp named Nothing' "$private")
 check() {  # check NAME PROGRAM
   local printed
   printed=$("$2" 2>/dev/null)

@@ -83,6 +83,7 @@ boost::shared_ptr<TMemoryNamespace> SourceOfEverything() {
 struct TCopied {
   std::string fText;
   EZEPStatusCode fStatus = kZEPStatusOK;
+  std::string fReason;
   std::vector<std::string> fLog;
 };
 
@@ -99,8 +100,9 @@ TCopied Copy(TTable const* from, TTable const* into) {
       TCIMCopy::CopyClasses(source, destination, false);
       if (into) into->fIsChecked = false;  // the copy is whole; what looks at it may call anything
       copied.fText = WriteMof(*copy);
-    } catch (TZEPException const& failure) {
+    } catch (TZEPFailure const& failure) {
       copied.fStatus = failure.GetStatusCode().GetCode();
+      copied.fReason = failure.Reason();
     } catch (std::logic_error const& notInTable) {
       ADD_FAILURE() << notInTable.what();
     }
@@ -167,6 +169,7 @@ TEST(InterfaceTableTest, AnOperationThatIsLeftOutEndsTheCopyWithOneLineThatNames
     TTable const table = TableOf(row.fUse, row.fOperation);
     TCopied const copied = row.fUse == kCopyFrom ? Copy(&table, nullptr) : Copy(nullptr, &table);
     EXPECT_EQ(copied.fStatus, kZEPStatusNotImplemented);
+    EXPECT_EQ(copied.fReason, row.fLine);
     EXPECT_THAT(copied.fLog, ElementsAre("[Error] " + std::string(row.fLine)));
   }
 }

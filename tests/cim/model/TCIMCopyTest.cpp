@@ -256,6 +256,22 @@ TEST_F(TCIMCopyTest, AnyEmptyAnswerOfTheDestinationIsNotFoundBeforeAnythingElseI
   }
 }
 
+TEST_F(TCIMCopyTest, ReasonNamesWhatTheDestinationDidNotReturn) {
+  std::pair<char const*, char const*> const rows[] = {
+      {"CreateClass dst:X_B under X_A", "the destination returned no class X_B"},
+      {"GetQualifierDecl dst:Description", "the destination returned no qualifier declaration Description"},
+      {"AddParameterDecl dst:X_B.Reset.Force", "the destination returned no parameter declaration Force"},
+      {"CreateInstance dst:QRVSG_ZEPProduct", "the destination returned no instance of QRVSG_ZEPProduct"},
+  };
+  for (auto const& [call, reason] : rows) {
+    SCOPED_TRACE(call);
+    TTrace trace;
+    trace.fEmptyAnswer = call;
+    auto const copy = boost::make_shared<TTracedNamespace>(trace, NewNamespace(), "dst");
+    EXPECT_EQ(ReasonOf([&] { TCIMCopy::CopyClasses(SourceOfEverything(), copy, false); }), reason);
+  }
+}
+
 TEST_F(TCIMCopyTest, AnEmptyAnswerWhileAPropertyIsDeclaredLeavesOneLineAndTheOthersAreCopied) {
   for (std::string const call : {"AddPropertyDecl dst:X_B.Name", "AddQualifier dst:X_B.Name Description"}) {
     SCOPED_TRACE(call);

@@ -410,6 +410,12 @@ TEST_F(TCIMReferenceTest, ReferencesAreNestedAtMost100Deep) {
   }
 }
 
+TEST_F(TCIMReferenceTest, ReasonTravelsWithTheFailure) {
+  EXPECT_EQ(ReasonOf([&] { TCIMReference(fNs, "ns:X_Nothing.Id=\"1\"", TCIMContext()); }),
+            "Reference specifies invalid class, path=ns:X_Nothing.Id=\"1\"");
+  EXPECT_EQ(ReasonOf([&] { Disk(7).AddKeyValue("Id", TCIMValue("5")); }), "Declaration type: uint32 Value type: string");
+}
+
 TEST_F(TCIMReferenceTest, FailuresInANestedPathLogTheCompletePathOnce) {
   struct {
     char const* path;

@@ -104,7 +104,8 @@ TEST_F(TNamespaceProviderManagerTest, UnknownNameIsLoggedAsOneErrorAndThrowsNotF
     SCOPED_TRACE(name);
     TLogCapture log;
     EXPECT_STATUS(fManager.GetNamespaceProvider(name), kZEPStatusNotFound);
-    EXPECT_EQ(log.Entries(), std::vector<std::string>({"[Error] Failed to find nsp named " + name}));
+    EXPECT_EQ(ReasonOf([&] { fManager.GetNamespaceProvider(name); }), "Failed to find nsp named " + name);
+    EXPECT_EQ(log.Entries(), std::vector<std::string>(2, "[Error] Failed to find nsp named " + name));
   }
 }
 

@@ -369,6 +369,11 @@ TEST(TCIMValueTest, AnElementOfAnotherTypeIsLoggedAndRefused) {
   });
 }
 
+TEST(TCIMValueTest, ReasonForAWrongElementTravelsWithTheFailure) {
+  EXPECT_EQ(ReasonOf([] { TCIMValue(TType::kCIMTypeUint8, 0, {TCIMValue("a")}); }),
+            "Attempting to create array of type uint8, but element is of type string.");
+}
+
 TEST(TCIMValueTest, TheWrongElementIsWrittenToTheLogAsAnError) {
   OnNewThread([] {
     TLogCapture const log;

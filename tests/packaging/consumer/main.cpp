@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Prints where the library lies, the host provider's class of the system, and what an empty pointer ends in.
+// Prints where the library lies, the host provider's class of the system, the exception for an empty
+// pointer, and the reason that a failure carries.
 
 #include <zepcore.h>
 
@@ -20,5 +21,10 @@ int main() {
     nothing->GetName(TCIMContext());
   } catch (TZEPException const& thrown) {
     std::cout << thrown.what() << "\n";
+  }
+  try {
+    TRootObject::GetNamespaceProviderManager()->GetNamespaceProvider("Nothing");
+  } catch (TZEPFailure const& thrown) {
+    std::cout << thrown.what() << ": " << thrown.Reason() << "\n";
   }
 }

@@ -341,7 +341,7 @@ std::vector<std::string> ErrorsOf(std::function<void()> const& action) {
   return errors;
 }
 
-TEST(TMemoryNamespaceTest, RefusalIsLogged) {
+TEST(TMemoryNamespaceTest, RefusalIsLoggedAndTravelsWithTheFailure) {
   auto const ns = NewNamespace();
   ns->DefineClass("X_Disk").Key("Id", "uint32");
   ns->AddInstance("X_Disk", {{"Id", 5}});
@@ -372,6 +372,7 @@ TEST(TMemoryNamespaceTest, RefusalIsLogged) {
   for (auto const& row : rows) {
     SCOPED_TRACE(row.message);
     EXPECT_THAT(ErrorsOf([&] { EXPECT_STATUS(row.action(), row.status); }), ElementsAre(row.message));
+    EXPECT_EQ(ReasonOf(row.action), row.message);
   }
   EXPECT_THAT(ClassNames(*ns), ElementsAre("X_Disk"));
   EXPECT_THAT(InstancePaths(*ns->GetClass("X_Disk", kNone)), ElementsAre("X_Disk.Id=\"5\""));

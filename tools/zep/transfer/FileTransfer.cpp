@@ -1,9 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/transfer/FileTransfer.h"
 
-#include "ILogger.h"
-#include "TRootObject.h"
-#include "TZEPException.h"
+#include "TZEPFailure.h"
 #include "tools/zep/processes/Descriptor.h"
 #include "tools/zep/transfer/Curl.h"
 #include "tools/zep/transfer/PartNote.h"
@@ -27,11 +25,6 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-[[noreturn]] void Fail(EZEPStatusCode status, std::string const& reason) {
-  if (ILogger* const logger = TRootObject::GetCoreLogger()) logger->OutputLogEntry(ILogger::kLogError, reason);
-  throw TZEPException(status);
-}
-
 // ---- libcurl ----
 
 using TCommands = std::vector<std::string>;
@@ -43,10 +36,10 @@ public:
   TConnection() {
     std::string failure;
     if (!Load(fCurl, failure))
-      Fail(kZEPStatusLibCurlFailure,
-           (fCurl.fLibrary ? "Error loading curl library: " : "Error opening curl library: ") + failure);
+      throw TZEPFailure(kZEPStatusLibCurlFailure,
+                        (fCurl.fLibrary ? "Error loading curl library: " : "Error opening curl library: ") + failure);
     if (fCurl.fGlobalInit(CURL_GLOBAL_ALL) == CURLE_OK) fHandle = fCurl.fInit();
-    if (fHandle == nullptr) Fail(kZEPStatusLibCurlFailure, "Error initalizing curl");
+    if (fHandle == nullptr) throw TZEPFailure(kZEPStatusLibCurlFailure, "Error initalizing curl");
     Set(CURLOPT_ERRORBUFFER, fError.data());
     Set(CURLOPT_FTP_USE_EPSV, 0L);
     Set(CURLOPT_PROXY, "");
@@ -94,8 +87,8 @@ public:
 
   [[noreturn]] static void FailFor(CURLcode code, std::string const& errorText) {
     if (code == CURLE_COULDNT_RESOLVE_HOST || code == CURLE_COULDNT_CONNECT)
-      Fail(kZEPStatusConnectionFailed, "Error connecting to Server");
-    Fail(kZEPStatusAccessDenied, "Error performing command: " + errorText);
+      throw TZEPFailure(kZEPStatusConnectionFailed, "Error connecting to Server");
+    throw TZEPFailure(kZEPStatusAccessDenied, "Error performing command: " + errorText);
   }
 
 private:
@@ -324,7 +317,7 @@ private:
 
   [[noreturn]] void FailForDirectory() {
     RemoveParts();
-    Fail(kZEPStatusAccessDenied, fNames.Name() + " is a directory; end the URL with \"/\"");
+    throw TZEPFailure(kZEPStatusAccessDenied, fNames.Name() + " is a directory; end the URL with \"/\"");
   }
 
   // The mode of the regular file at the place; -1 when the server does not report it. FTP servers do not.
@@ -483,7 +476,7 @@ private:
 
   [[noreturn]] void FailFor(CURLcode code) {
     if (fError == EEXIST) throw TZEPException(kZEPStatusAlreadyExists);
-    if (fError != 0) Fail(kZEPStatusFileSystemError, std::strerror(fError));
+    if (fError != 0) throw TZEPFailure(kZEPStatusFileSystemError, std::strerror(fError));
     TConnection::FailFor(code, fConnection.ErrorText());
   }
 

@@ -58,8 +58,8 @@ private:
   TTransferState* fState;
 };
 
-// Both are for a process of their own (RunWatched). They transfer as the library does, by FTP or SFTP through libcurl and without
-// a proxy, fail with its status codes, and log the reason as an error.
+// Call these functions in a process of their own (RunWatched). They transfer as the library does, by FTP or SFTP through libcurl
+// and without a proxy, and throw TZEPFailure with the library's status codes.
 
 // Names that no other transfer has.
 TUploadNames NamesForUpload(TRemote const& place);

@@ -1,9 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/transfer/Watched.h"
 
-#include "ILogger.h"
-#include "TRootObject.h"
-#include "TZEPException.h"
+#include "TZEPFailure.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/processes/Interrupts.h"
 #include "tools/zep/processes/TChildProcess.h"
@@ -39,31 +37,24 @@ EExitStatus ExitStatusOf(TZEPStatusCode const& status) {
 
 // ---- In the child ----
 
-// What the library logged last as an error, less the name of the operation.
-std::string LoggedReason() {
-  ILogger* const logger = TRootObject::GetCoreLogger();
-  if (logger == nullptr || logger->GetLog().empty()) return "";
-  std::string const& message = logger->GetLog().back().fMessage;
-  std::size_t const name = message.find(": ");
-  return message.rfind("TOSSpecific|", 0) == 0 && name != message.npos ? message.substr(name + 2) : message;
-}
-
-// The report of the child: the status as a number, a blank, and the reason.
-std::string ReportOf(std::function<TZEPStatusCode()> const& transfer) {
-  TZEPStatusCode status = kZEPStatusFail;
-  std::string reason;
-  try {
-    status = transfer();
-  } catch (TZEPException const& failure) {
-    status = failure.GetStatusCode();
-  } catch (std::exception const& failure) {
-    reason = failure.what();
-  }
-  if (reason.empty() && status != kZEPStatusOK) reason = LoggedReason();
+std::string ReportText(TZEPStatusCode const& status, std::string const& reason) {
   return std::to_string(status.GetCode()) + " " + reason;
 }
 
-// A file that would become larger breaks off with an error of writing.
+// The report of the child: the status as a number, a blank, and the reason, which is empty when the failure carries none.
+std::string ReportOf(std::function<TZEPStatusCode()> const& transfer) {
+  try {
+    return ReportText(transfer(), "");
+  } catch (TZEPFailure const& failure) {
+    return ReportText(failure.GetStatusCode(), failure.Reason());
+  } catch (TZEPException const& failure) {
+    return ReportText(failure.GetStatusCode(), "");
+  } catch (std::exception const& failure) {
+    return ReportText(kZEPStatusFail, failure.what());
+  }
+}
+
+// Writing more than that to a file fails.
 void LimitFiles(std::uint64_t most) {
   rlimit const limit{most, most};
   ::signal(SIGXFSZ, SIG_IGN);
@@ -75,7 +66,6 @@ std::string ReportOfSilent(std::function<TZEPStatusCode()> const& transfer, std:
   TDescriptor const nowhere(::open("/dev/null", O_RDWR));
   ::dup2(nowhere.Get(), STDIN_FILENO);
   ::dup2(nowhere.Get(), STDOUT_FILENO);
-  if (ILogger* const logger = TRootObject::GetCoreLogger()) logger->ClearLog();
   return ReportOf(transfer);
 }
 
@@ -88,7 +78,7 @@ std::uint64_t BytesMoved(TWatch const& watch) {
   return absent ? 0 : size;
 }
 
-// Where libcurl itself is missing, and not a function of it, the package that has it is named.
+// When libcurl itself is missing, and not only one of its functions, the package to install.
 std::string RemedyFor(std::string const& reason) {
   bool const isMissing = reason.find("Error opening curl library: ") != reason.npos;
   return isMissing ? "; install the package libcurl4" : "";
@@ -104,7 +94,7 @@ TOutcome OutcomeOf(std::string const& report) {
   TZEPStatusCode const status(static_cast<EZEPStatusCode>(std::stoi(report.substr(0, blank))));
   if (status == kZEPStatusOK) return {status, kExitComplete, ""};
   std::string reason = Printable(MessageWithoutSecrets(report.substr(blank + 1)));
-  if (EndsWith(reason, ": ")) reason += "libcurl does not tell why";
+  if (EndsWith(reason, ": ")) reason += "libcurl reports no reason";
   reason += RemedyFor(reason);
   return {status, ExitStatusOf(status), reason.empty() ? status.TranslateStatusCode() : reason};
 }

@@ -30,9 +30,9 @@ struct TOutcome {
   std::string fReason;                // why it failed, for people
 };
 
-// Does one transfer of the library in a process of its own, which can be ended when nothing moves any more: the library itself
-// waits for ever. An interrupt (Interrupts.h) ends it too. That process reads no input and prints nothing; what it throws is the
-// outcome.
+// Runs one transfer of the library in a process of its own, which is ended when nothing moves any more: the library itself
+// would wait for ever. An interrupt (Interrupts.h) ends it, too. That process reads no input and prints nothing. It passes on the
+// status that `transfer` returns or throws, with the reason of a TZEPFailure.
 TOutcome RunWatched(std::function<TZEPStatusCode()> const& transfer, TWatch const& watch);
 
 // The outcome when an interrupt is pending (Interrupts.h).

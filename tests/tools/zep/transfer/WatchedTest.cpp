@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/transfer/Watched.h"
 
-#include "TZEPException.h"
+#include "TZEPFailure.h"
 #include "tests/Support.h"
 #include "tools/zep/processes/Interrupts.h"
 #include "tools/zep/secrets/Secrets.h"
@@ -19,16 +19,11 @@
 namespace NQRVZEP20::zep {
 namespace {
 
-void Log(char const* message) { TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, message); }
-
-std::function<TZEPStatusCode()> Thrown(EZEPStatusCode status, char const* message) {
-  return [=]() -> TZEPStatusCode {
-    Log(message);
-    throw TZEPException(status);
-  };
+std::function<TZEPStatusCode()> Thrown(EZEPStatusCode status, char const* reason) {
+  return [=]() -> TZEPStatusCode { throw TZEPFailure(status, reason); };
 }
 
-TEST(RunWatchedTest, WhatATransferThrowsIsTheOutcome) {
+TEST(RunWatchedTest, OutcomeIsWhatTheTransferThrows) {
   struct TRow {
     std::function<TZEPStatusCode()> transfer;
     EExitStatus exit;
@@ -36,17 +31,19 @@ TEST(RunWatchedTest, WhatATransferThrowsIsTheOutcome) {
   };
   TRow const rows[] = {
       {[] { return kZEPStatusOK; }, kExitComplete, ""},
-      {Thrown(kZEPStatusConnectionFailed, "TOSSpecific|CurlTransferFile: Error connecting to Server"), kExitNoConnection,
-       "Error connecting to Server"},
-      {Thrown(kZEPStatusLibCurlFailure, "TOSSpecific|CurlTransferFile: Error initalizing curl"), kExitNoLibrary,
-       "Error initalizing curl"},
-      {Thrown(kZEPStatusLibCurlFailure, "TOSSpecific|CurlTransferFile: Error opening curl library: x"), kExitNoLibrary,
+      {Thrown(kZEPStatusConnectionFailed, "Error connecting to Server"), kExitNoConnection, "Error connecting to Server"},
+      {Thrown(kZEPStatusLibCurlFailure, "Error initalizing curl"), kExitNoLibrary, "Error initalizing curl"},
+      {Thrown(kZEPStatusLibCurlFailure, "Error opening curl library: x"), kExitNoLibrary,
        "Error opening curl library: x; install the package libcurl4"},
-      {Thrown(kZEPStatusAccessDenied, "TOSSpecific|CurlTransferFile: Error performing command: a\x1b[1m topsecret b"),
-       kExitNothing, "Error performing command: a\\x1b[1m *** b"},
+      {Thrown(kZEPStatusAccessDenied, "Error performing command: a\x1b[1m topsecret b"), kExitNothing,
+       "Error performing command: a\\x1b[1m *** b"},
       {Thrown(kZEPStatusFail, "of another kind: x"), kExitNothing, "of another kind: x"},
       {[]() -> TZEPStatusCode { throw std::runtime_error("no luck"); }, kExitNothing, "no luck"},
-      {[]() -> TZEPStatusCode { throw TZEPException(kZEPStatusFileSystemError); }, kExitNothing, "kZEPStatusFileSystemError"},
+      {[]() -> TZEPStatusCode {
+         TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, "a line of the log is not a reason");
+         throw TZEPException(kZEPStatusFileSystemError);
+       },
+       kExitNothing, "kZEPStatusFileSystemError"},
       {[] { return kZEPStatusConnectionFailed; }, kExitNoConnection, "kZEPStatusConnectionFailed"},
       {[]() -> TZEPStatusCode {
          ::raise(SIGKILL);
@@ -54,7 +51,7 @@ TEST(RunWatchedTest, WhatATransferThrowsIsTheOutcome) {
        },
        kExitNothing, "the process of the transfer died"},
   };
-  Log("an error before the transfer");
+  TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, "an error before the transfer");
   Hide("topsecret");
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.reason);
@@ -64,10 +61,9 @@ TEST(RunWatchedTest, WhatATransferThrowsIsTheOutcome) {
   }
 }
 
-TEST(RunWatchedTest, AReasonThatIsEmptyIsSaidToBe) {
-  TOutcome const outcome =
-      RunWatched(Thrown(kZEPStatusAccessDenied, "TOSSpecific|CurlTransferFile: Error performing command: "), {});
-  EXPECT_EQ(outcome.fReason, "Error performing command: libcurl does not tell why");
+TEST(RunWatchedTest, EmptyReasonOfLibcurlIsReported) {
+  TOutcome const outcome = RunWatched(Thrown(kZEPStatusAccessDenied, "Error performing command: "), {});
+  EXPECT_EQ(outcome.fReason, "Error performing command: libcurl reports no reason");
 }
 
 TEST(RunWatchedTest, TheTransferReadsNoInputAndPrintsNothing) {

@@ -1,0 +1,39 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "TZEPException.h"
+
+#include <memory>
+#include <string>
+#include <utility>
+
+namespace NQRVZEP20 {
+
+// A TZEPException that also carries the reason for the failure, as a text for people. The library throws it wherever a header
+// states that a failure is logged and thrown: the reason is that of the log line. TCIMCopy throws it without a line. A plug-in
+// may throw it, too. Code that catches TZEPException catches it as well:
+//
+//   } catch (TZEPFailure const& failure) {
+//     std::cerr << failure.what() << ": " << failure.Reason() << "\n";
+//   }
+//
+// Copies share the text, and copying does not throw.
+class ZEP_EXPORT TZEPFailure : public TZEPException {
+public:
+  // Throws std::bad_alloc when memory is short.
+  TZEPFailure(TZEPStatusCode code, std::string reason)
+      : TZEPException(code), fReason(std::make_shared<std::string const>(std::move(reason))) {}
+  TZEPFailure(TZEPFailure const&) noexcept = default;
+  TZEPFailure& operator=(TZEPFailure const&) noexcept = default;
+  ~TZEPFailure() override = default;
+
+  // Why the operation failed, such as "libFan.nsp.so: cannot open shared object file". It names neither the status code nor
+  // the function that failed, and may contain bytes that cannot be printed when they come from a file or a server. Valid as
+  // long as this exception or a copy of it exists.
+  std::string const& Reason() const noexcept { return *fReason; }
+
+private:
+  std::shared_ptr<std::string const> fReason;  // never null
+};
+
+}  // namespace NQRVZEP20
