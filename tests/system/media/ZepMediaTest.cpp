@@ -14,6 +14,7 @@
 #include <sys/sysmacros.h>
 
 #include <cerrno>
+#include <csignal>
 #include <cstdio>
 
 namespace {
@@ -446,6 +447,46 @@ TEST_F(ZepMediaTest, ALoopDeviceDetachedInTheMiddleStillGetsTheReport) {
     return run.errors + "exit status " + std::to_string(run.status) + " " + Joined(NamesIn(fDir.Path("key")));
   });
   EXPECT_THAT(text, StartsWith("exit status 0 label.txt zep-report-sample-server-"));
+}
+
+// The signal arrives while the report is being written: before the first fsync the file still has its temporary name.
+TEST_F(ZepMediaTest, InterruptedReportLeavesTheMediumUnmountedAndNoPart) {
+  MakeImage(fDir.Path("key"), "whole");
+  for (int const signal : {SIGINT, SIGTERM, SIGHUP}) {
+    SCOPED_TRACE(signal);
+    std::string const text = WithZep([&] {
+      TLoopDevice const loop(fDir.Path("key"));
+      TCall call = {{"report", "--sample", "--json", "--to-media", loop.Path()}};
+      call.environment = {{"LD_PRELOAD", ZEP_PULLS_OUT}, {"ZEP_RAISE", std::to_string(signal)}, {"ZEP_PULL_AT", "1"}};
+      TRun const run = fInstallation->Run(call);
+      bool const isMounted = !fs::is_empty("/mnt/key");
+      if (isMounted) Do("umount /mnt/key");
+      return Replaced(run.errors, loop.Path(), "LOOP") + std::to_string(run.status) + " " + JsonOf(run)["exitStatus"].dump() +
+             (isMounted ? " mounted " : " unmounted ") + Joined(NamesIn(fDir.Path("key")));
+    });
+    std::string const status = std::to_string(128 + signal);
+    EXPECT_THAT(text,
+                testing::MatchesRegex("zep: zep-report-sample-server-[0-9TZ]*\\.json cannot be written on LOOP: interrupted\n" +
+                                      status + " " + status + " unmounted label.txt"));
+  }
+}
+
+// At the second fsync the file has its name.
+TEST_F(ZepMediaTest, InterruptAfterTheReportIsCompleteStillUnmountsTheMedium) {
+  MakeImage(fDir.Path("key"), "whole");
+  std::string const text = WithZep([&] {
+    TLoopDevice const loop(fDir.Path("key"));
+    TCall call = {{"report", "--sample", "--to-media", loop.Path()}};
+    call.environment = {{"LD_PRELOAD", ZEP_PULLS_OUT}, {"ZEP_RAISE", std::to_string(SIGINT)}, {"ZEP_PULL_AT", "2"}};
+    TRun const run = fInstallation->Run(call);
+    bool const isMounted = !fs::is_empty("/mnt/key");
+    if (isMounted) Do("umount /mnt/key");
+    return Replaced(run.output + run.errors, loop.Path(), "LOOP") + std::to_string(run.status) +
+           (isMounted ? " mounted " : " unmounted ") + Joined(NamesIn(fDir.Path("key")));
+  });
+  EXPECT_THAT(text,
+              testing::MatchesRegex("zep: (zep-report-sample-server-[0-9TZ]*\\.txt) is written on LOOP, which can be taken out: "
+                                    "interrupted\n130 unmounted label.txt zep-report-.*\\.txt"));
 }
 
 TEST_F(ZepMediaTest, AReportOnABusyMediumIsThereThoughItCannotBeUnmounted) {

@@ -37,8 +37,8 @@ struct TArguments {
   std::string fMedium;  // the device to write to; empty for standard output
 };
 
-// Returns where the medium is still mounted. Unmounts also a medium that could not be written; the failed write is then the
-// reason that is thrown.
+// Returns where the medium is still mounted. A medium that could not be written, or whose writing was interrupted, is unmounted,
+// too; the exception is then that of the writing.
 std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::string const& name, std::string const& text) {
   try {
     medium.Write(name, text);
@@ -63,6 +63,7 @@ TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
   std::string const text = arguments.fAsJson ? AsVerbatimText(ReportAsJson(report)) : ReportAsText(report);
   TMountedMedium const medium(arguments.fMedium);
   std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);
+  ThrowIfInterrupted(name + " is written on " + medium.Device() + ", which " + WhetherToTakeOut(stillMountedAt));
 
   TJson document = DocumentHead(kToMedia, ExitStatusOf(report.fCompleteness), WhyNotComplete(report), SampleLabelOf(report));
   document["device"] = medium.Device();
@@ -97,13 +98,13 @@ void AddSending(TJson& document, TSentReport const& sent) {
 }
 
 // Prints or stores the report, and sends it if that was requested. The JSON document is printed last, because it contains the
-// exit status.
-int Deliver(TReport const& report, TTarget const& target, TArguments const& arguments) {
+// exit status. From the mounting of the medium on, and while the report is sent, `guard` holds back interrupts.
+int Deliver(TReport const& report, TTarget const& target, TArguments const& arguments, std::optional<TInterruptGuard>& guard) {
   EExitStatus status = ExitStatusOf(report.fCompleteness);
+  if (!arguments.fMedium.empty()) guard.emplace();
   TJson document = PrintOrWrite(report, arguments);
-  std::optional<TInterruptGuard> guard;
   if (!arguments.fTarget.empty()) {
-    guard.emplace();
+    if (!guard) guard.emplace();
     TSentReport const sent = SendReport(report, target, arguments.fOptions);
     if (sent.fTransferred.fOutcome.fExit != kExitComplete) status = sent.fTransferred.fOutcome.fExit;
     AddSending(document, sent);
@@ -112,17 +113,21 @@ int Deliver(TReport const& report, TTarget const& target, TArguments const& argu
   return status;
 }
 
+// Prints the message of an interrupted run itself: the signal ends zep when `guard` ends.
 int Report(TArguments const& arguments) {
   std::optional<TSample> sample;
+  std::optional<TInterruptGuard> guard;
   try {
     TTarget const target = arguments.fTarget.empty() ? TTarget{} : TargetOf(arguments.fTarget, arguments.fBySftp);
     if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
     sample = SampleIf(arguments.fSample);
-    return Deliver(MakeReport(LoadPlugInsQuietly(sample), sample), target, arguments);
+    return Deliver(MakeReport(LoadPlugInsQuietly(sample), sample), target, arguments, guard);
   } catch (std::exception const& failure) {
     bool const isOfMedium = !arguments.fMedium.empty() && arguments.fAsJson && !HasWrittenOutput();
     if (isOfMedium) WriteOutput(FailureAsJson(kToMedia, StatusOf(failure), failure.what(), sample ? sample->fLabel : ""));
-    throw;
+    if (PendingInterrupt() == 0) throw;
+    std::cerr << "zep: " << Printable(failure.what()) << "\n";
+    return StatusOf(failure);
   }
 }
 

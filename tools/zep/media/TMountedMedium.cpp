@@ -7,6 +7,7 @@
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/processes/Descriptor.h"
+#include "tools/zep/processes/Interrupts.h"
 
 #include <fcntl.h>
 #include <unistd.h>
@@ -86,6 +87,7 @@ TMount MountOrThrow(std::string const& device, std::string const& mountPoint) {
     Throw("the directory " + mountPoint + " cannot be made: " + failure.what());
   }
   try {
+    TInterruptsBlocked const blocked;
     TOSSpecific::MountDevice(device);
   } catch (TZEPException const&) {
     Throw(device + " cannot be mounted: neither it nor " + FirstPartitionOf(device) + " has a file system that can be read");
@@ -131,11 +133,12 @@ TMountedMedium::TMountedMedium(std::string const& device) {
 
 void TMountedMedium::Write(std::string const& name, std::string const& contents) const {
   std::string const what = name + " cannot be written on " + Device();
+  ThrowIfInterrupted(what);
   if (fMount.fIsReadOnly) Throw(what + ": the medium is read-only");
   TDescriptor const directory = Open(AT_FDCWD, fMountPoint, O_RDONLY | O_DIRECTORY);
   ThrowIf(!directory, what);
 
-  // Under another name at first, so that a medium that is pulled out never bears half a file under this one.
+  // Under another name at first, so that a medium that is pulled out never has an incomplete file under the final name.
   std::string const draft = name + ".part";
   std::string present = draft;
   TDescriptor const file = Open(directory.Get(), draft, O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW);
@@ -143,6 +146,7 @@ void TMountedMedium::Write(std::string const& name, std::string const& contents)
   try {
     ThrowIf(!WriteWhole(file.Get(), contents), what);
     ThrowIf(::fsync(file.Get()) != 0, what);
+    ThrowIfInterrupted(what);
     RenameToNew(directory.Get(), draft, name, what);
     present = name;
     SyncDirectory(directory.Get(), what);
@@ -163,6 +167,7 @@ std::vector<std::string> UnmountDirectory(std::string const& directory) {
   // Opened before: it then tells of what could not be written while unmounting.
   TDescriptor const source = Open(AT_FDCWD, mount->fSource, O_RDONLY | O_NONBLOCK);
   try {
+    TInterruptsBlocked const blocked;
     TOSSpecific::UnmountDevice(mount->fSource, directory);
   } catch (TZEPException const&) {
     Throw(directory + " cannot be unmounted: something still uses it");

@@ -17,8 +17,8 @@ public:
   std::string const& Device() const { return fMount.fSource; }  // what is mounted: the device or its first partition
   std::string const& MountPoint() const { return fMountPoint; }
 
-  // Writes a file into the topmost directory. When it returns, the file is on the medium, whole. When it throws, there is no
-  // file of that name, unless there was one before.
+  // Writes a file into the root directory. When it returns, the complete file is on the medium. When it throws, also for a
+  // pending interrupt (Interrupts.h), there is no file of that name, unless there was one before.
   void Write(std::string const& name, std::string const& contents) const;
 
 private:

@@ -1,10 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/processes/Interrupts.h"
 
-#include <signal.h>
+#include "tools/zep/output/Failure.h"
 
 #include <array>
-#include <stdexcept>
 
 namespace NQRVZEP20::zep {
 
@@ -34,10 +33,30 @@ TInterruptGuard::~TInterruptGuard() {
   gPending = 0;
 }
 
+TInterruptsBlocked::TInterruptsBlocked() {
+  sigset_t signals;
+  ::sigemptyset(&signals);
+  for (int const signal : kSignals) ::sigaddset(&signals, signal);
+  ::sigprocmask(SIG_BLOCK, &signals, &fBefore);
+}
+
+TInterruptsBlocked::~TInterruptsBlocked() { ::sigprocmask(SIG_SETMASK, &fBefore, nullptr); }
+
 int PendingInterrupt() { return gPending; }
 
-void ThrowIfInterrupted() {
-  if (gPending != 0) throw std::runtime_error("interrupted");
+EExitStatus StatusOfInterrupt() {
+  switch (gPending) {
+    case SIGHUP:
+      return kExitHangUp;
+    case SIGINT:
+      return kExitInterrupt;
+    default:
+      return kExitTermination;
+  }
+}
+
+void ThrowIfInterrupted(std::string const& what) {
+  if (gPending != 0) throw TFailure(StatusOfInterrupt(), what.empty() ? "interrupted" : what + ": interrupted");
 }
 
 }  // namespace NQRVZEP20::zep

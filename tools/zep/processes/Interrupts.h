@@ -1,10 +1,17 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "tools/zep/output/ExitStatus.h"
+
+#include <signal.h>
+
+#include <string>
+
 namespace NQRVZEP20::zep {
 
-// While one lives, SIGHUP, SIGINT and SIGTERM do not end zep at once, so that what it made can be removed and what is left be
-// told. They interrupt what waits, and have their effect at the end of the guard. A signal that is ignored stays so.
+// While a guard exists, SIGHUP, SIGINT and SIGTERM do not end zep at once, so that it can remove what it made and report what is
+// left. They interrupt blocking calls, and have their effect at the end of the guard: a guard must therefore outlive the handler
+// that prints the message. A signal that is ignored stays ignored.
 class TInterruptGuard {
 public:
   TInterruptGuard();
@@ -13,10 +20,26 @@ public:
   TInterruptGuard& operator=(TInterruptGuard const&) = delete;
 };
 
-// The signal that came, and has not had its effect; 0 when none did.
+// While one exists, these signals are blocked for zep and for the programs that it starts, so that a Ctrl-C on the terminal does
+// not end a program in the middle. They arrive at its end.
+class TInterruptsBlocked {
+public:
+  TInterruptsBlocked();
+  ~TInterruptsBlocked();
+  TInterruptsBlocked(TInterruptsBlocked const&) = delete;
+  TInterruptsBlocked& operator=(TInterruptsBlocked const&) = delete;
+
+private:
+  sigset_t fBefore;
+};
+
+// The signal that arrived and has not had its effect yet; 0 when there is none.
 int PendingInterrupt();
 
-// Throws std::runtime_error when one came.
-void ThrowIfInterrupted();
+// The exit status that a document gives for the pending interrupt.
+EExitStatus StatusOfInterrupt();
+
+// Throws TFailure with that status when an interrupt is pending. The text is `what` and ": interrupted", or "interrupted" alone.
+void ThrowIfInterrupted(std::string const& what = "");
 
 }  // namespace NQRVZEP20::zep

@@ -124,11 +124,7 @@ bool ReadReport(TChildProcess& child, TWatch const& watch, std::string& report) 
 
 }  // namespace
 
-TOutcome Interrupted() {
-  int const signal = PendingInterrupt();
-  EExitStatus const exit = signal == SIGHUP ? kExitHangUp : signal == SIGINT ? kExitInterrupt : kExitTermination;
-  return {kZEPStatusFail, exit, "interrupted"};
-}
+TOutcome Interrupted() { return {kZEPStatusFail, StatusOfInterrupt(), "interrupted"}; }
 
 TOutcome RunWatched(std::function<TZEPStatusCode()> const& transfer, TWatch const& watch) {
   TChildProcess child([&] { return ReportOfSilent(transfer, watch.fMostBytes); }, SIGKILL);  // a transfer does not outlive zep
