@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "os/MediaTexts.h"
 
+#include <algorithm>
 #include <charconv>
+#include <iterator>
 
 namespace NQRVZEP20 {
 namespace {
@@ -16,15 +18,8 @@ std::string_view TakeLine(std::string_view& text) {
 
 bool Holds(std::string_view line, std::string_view part) { return line.find(part) != line.npos; }
 
-std::string Trimmed(std::string_view text) {
-  constexpr char const* blanks = " \t\r";
-  std::size_t const first = text.find_first_not_of(blanks);
-  if (first == text.npos) return "";
-  return std::string(text.substr(first, text.find_last_not_of(blanks) - first + 1));
-}
-
-// The number behind `label` and blanks: 3 of "Dev#=  3".
-std::optional<int> NumberBehind(std::string_view line, std::string_view label) {
+// The number after `label` and blanks: 3 of "Dev#=  3".
+std::optional<int> NumberAfter(std::string_view line, std::string_view label) {
   std::size_t const at = line.find(label);
   if (at == line.npos) return std::nullopt;
   std::string_view rest = line.substr(at + label.size());
@@ -35,6 +30,18 @@ std::optional<int> NumberBehind(std::string_view line, std::string_view label) {
 }
 
 }  // namespace
+
+std::string MountPointOf(std::string const& device) {
+  bool const isFloppy = std::find(std::begin(kFloppyDevices), std::end(kFloppyDevices), device) != std::end(kFloppyDevices);
+  return isFloppy ? kFloppyMountPoint : kKeyMountPoint;
+}
+
+std::string Trimmed(std::string_view text) {
+  constexpr char const* blanks = " \t\r";
+  std::size_t const first = text.find_first_not_of(blanks);
+  if (first == text.npos) return "";
+  return std::string(text.substr(first, text.find_last_not_of(blanks) - first + 1));
+}
 
 std::vector<std::string> DeviceFilesIn(std::string_view hwinfoOutput, std::string_view header, std::string_view marker) {
   constexpr std::string_view label = "Device File:";
@@ -74,7 +81,7 @@ bool Lists(std::string_view usbDevices, TUsbDevice const& device) {
   while (!usbDevices.empty()) {
     std::string_view const line = TakeLine(usbDevices);  // "T:  Bus=02 Lev=01 Prnt=01 Port=02 Cnt=01 Dev#=  2 ..."
     if (line.substr(0, 2) != "T:") continue;
-    if (NumberBehind(line, "Bus=") == device.fBus && NumberBehind(line, "Dev#=") == device.fDevice) return true;
+    if (NumberAfter(line, "Bus=") == device.fBus && NumberAfter(line, "Dev#=") == device.fDevice) return true;
   }
   return false;
 }

@@ -8,10 +8,20 @@
 
 namespace NQRVZEP20 {
 
-// What other programs and the kernel write of devices, read.
+// Reads what other programs and the kernel print about devices.
 
-// The device files in hwinfo's output of those devices whose block has a line that holds `header` and, behind it, one that
-// holds `marker`; each as hwinfo writes it, "/dev/sdc (/dev/sg3)".
+constexpr char kKeyMountPoint[] = "/mnt/key";
+constexpr char kFloppyMountPoint[] = "/mnt/floppy";
+constexpr char const* kFloppyDevices[] = {"/dev/floppy", "/dev/fd0", "/dev/fd1"};
+
+// Where a device is mounted.
+std::string MountPointOf(std::string const& device);
+
+// The text without blanks, tabs and carriage returns at either end.
+std::string Trimmed(std::string_view text);
+
+// The device files in hwinfo's output of those devices whose block has a line that contains `header` and, after it, one that
+// contains `marker`; each as hwinfo prints it, "/dev/sdc (/dev/sg3)".
 std::vector<std::string> DeviceFilesIn(std::string_view hwinfoOutput, std::string_view header, std::string_view marker);
 
 // "/dev/sdc (/dev/sg3)" becomes "/dev/sdc".

@@ -4,6 +4,7 @@
 #include "TOSSpecific.h"
 #include "TZEPException.h"
 #include "core/Log.h"
+#include "os/SettingLine.h"
 
 #include <algorithm>
 #include <cstdint>
@@ -31,25 +32,19 @@ std::string LinesOf(std::istream& file) {
   return text;
 }
 
-// One line of the file. The texts lie in what was read.
+// A setting of the file. The texts are parts of the text that was read.
 struct TSetting {
   std::string_view fKey, fValue;
   std::uint64_t fHead = 0;  // see SortByKey
 };
 
-bool IsComment(std::string_view line) { return !line.empty() && line.front() == '#'; }
-
 std::vector<TSetting> SettingsOf(std::string_view text) {
   std::vector<TSetting> settings;
   while (!text.empty()) {
     std::size_t const end = text.find('\n');
-    std::string_view const line = text.substr(0, end);
+    TSettingLine const line = ReadSettingLine(text.substr(0, end));
     text.remove_prefix(end + 1);
-    if (IsComment(line)) continue;
-    // Without "=" the value starts where the line does: a bare word maps to itself. Kept.
-    std::size_t const equals = line.find('=');
-    TSetting const setting{line.substr(0, equals), line.substr(equals + 1)};
-    if (!setting.fKey.empty() && !setting.fValue.empty()) settings.push_back(setting);
+    if (line.IsSetting()) settings.push_back({line.fKey, line.fValue});
   }
   return settings;
 }

@@ -24,15 +24,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-constexpr char kKeyMountPoint[] = "/mnt/key";
-constexpr char kFloppyMountPoint[] = "/mnt/floppy";
-constexpr char const* kFloppyDevices[] = {"/dev/floppy", "/dev/fd0", "/dev/fd1"};
-
 bool Succeeds(std::string const& command) { return std::system(command.c_str()) == 0; }
-
-bool IsFloppy(std::string const& device) {
-  return std::find(std::begin(kFloppyDevices), std::end(kFloppyDevices), device) != std::end(kFloppyDevices);
-}
 
 // ---- The controller's virtual devices ----
 
@@ -201,7 +193,7 @@ void AddFloppyDrive(std::vector<TRemovableMedium>& media) {
 }  // namespace
 
 std::string TOSSpecific::MountDevice(std::string device) {
-  std::string const mountPoint = IsFloppy(device) ? kFloppyMountPoint : kKeyMountPoint;
+  std::string const mountPoint = MountPointOf(device);
   // Whatever is mounted there already, it stays and will do. Kept.
   if (Succeeds("mount | grep \"" + mountPoint + " type\" >/dev/null")) return mountPoint;
   if (Succeeds("mount " + device + " " + mountPoint + " 2>/dev/null")) return mountPoint;

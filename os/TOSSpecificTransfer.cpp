@@ -3,6 +3,7 @@
 #include "core/Failure.h"
 #include "core/Handles.h"
 #include "os/ProxyCheck.h"
+#include "os/RemotePath.h"
 #include "os/WriteContext.h"
 
 #include <fcntl.h>
@@ -107,13 +108,6 @@ void Upload(TCurl& curl, std::string const& url, TUniqueFile& stream, std::strin
   CreateMissingDirectories(curl);
   PerformTransfer(curl);
   CheckWasReadToItsEnd(stream.get());
-}
-
-// Where an upload goes on the server: on bootable media always into the directory that the maker's server has for them.
-std::string RemotePathOf(std::string const& remoteName) {
-  char const* const isBootable = std::getenv("ZEP_ISBOOTABLE");
-  if (isBootable != nullptr && std::string(isBootable) == "yes") return "hostline/toqrv/vantor/fdr_upload/" + remoteName;
-  return remoteName;
 }
 
 }  // namespace

@@ -5,6 +5,7 @@
 #include "TZEPException.h"
 #include "core/Handles.h"
 #include "core/Log.h"
+#include "proxy/WpadQuery.h"
 
 #include <arpa/inet.h>
 #include <net/if.h>
@@ -25,16 +26,17 @@
 #include <string_view>
 #include <vector>
 
+using NQRVZEP20::kDhcpClientPort;
+using NQRVZEP20::kWpadAttempts;
+using NQRVZEP20::kWpadReplySeconds;
 using NQRVZEP20::LogDebug;
+using NQRVZEP20::ShownIPV6Address;
 using NQRVZEP20::TOSSpecific;
 using NQRVZEP20::TUniqueFd;
 
 namespace {
 
 constexpr int kServerPort = 67;
-constexpr int kClientPort = 68;
-constexpr int kReplySeconds = 6;
-constexpr int kSendAttempts = 3;
 constexpr int kBindAttempts = 11;
 constexpr int kBindPauseSeconds = 3;
 constexpr int kCommandSilenceSeconds = 300;
@@ -91,16 +93,6 @@ void EndProcess(std::string const& number) {
   // The null device is misspelt: the output goes to a file of that name. Kept.
   std::string const command = "kill " + number + " > /dev/nul 2>&1";
   [[maybe_unused]] int const ignored = std::system(command.c_str());
-}
-
-// The first address that "ifconfig" prints after the label, without its prefix length; empty when the label is missing.
-std::string ShownIPV6Address() {
-  constexpr std::string_view kLabel = "inet6 addr: ";
-  std::string const shown = OutputOf("ifconfig", {});
-  std::size_t const label = shown.find(kLabel);
-  if (label == std::string::npos) return "";
-  std::size_t const start = label + kLabel.size();
-  return shown.substr(start, shown.find_first_of("/ \t\r\n", start) - start);
 }
 
 // ---- Interfaces ----
@@ -181,7 +173,7 @@ using TReply = std::array<unsigned char, AutoProxyDiscovery::kMessageSize>;
 
 // Any packet that arrives at the port counts as the reply; its transaction number is not compared. Kept.
 bool Receive(int receiver, TReply& reply) {
-  AutoProxyDiscovery::readable_timeo(receiver, kReplySeconds);
+  AutoProxyDiscovery::readable_timeo(receiver, kWpadReplySeconds);
   if (::recv(receiver, reply.data(), reply.size(), 0) >= 0) return true;
   LogDebug("receiving  DHCP message error!");
   return false;
@@ -191,7 +183,7 @@ bool Receive(int receiver, TReply& reply) {
 // Bytes that the reply does not fill are 0.
 std::string SendAndReceive(int sender, int receiver, unsigned char const* message) {
   TReply reply{};
-  for (int attempt = 1; attempt <= kSendAttempts; ++attempt) {
+  for (int attempt = 1; attempt <= kWpadAttempts; ++attempt) {
     if (AutoProxyDiscovery::send_packet(sender, message, AutoProxyDiscovery::kMessageSize) < 0)
       LogDebug("sending DHCP message error!");
     if (Receive(receiver, reply)) return AutoProxyDiscovery::dhcp_parser(reply.data() + AutoProxyDiscovery::kOptionsOffset);
@@ -341,7 +333,7 @@ int AutoProxyDiscovery::open_recv_socket(char*) {
     LogDebug("setup socket failed!");
     return -1;
   }
-  for (int attempt = 1; !BindTo(receiver.get(), AddressOf(INADDR_ANY, kClientPort)); ++attempt) {
+  for (int attempt = 1; !BindTo(receiver.get(), AddressOf(INADDR_ANY, kDhcpClientPort)); ++attempt) {
     LogDebug("bind to DHCP_CLIENT_PORT failed!");
     if (attempt == kBindAttempts) break;  // the socket is returned without a port. Kept.
     ::sleep(kBindPauseSeconds);

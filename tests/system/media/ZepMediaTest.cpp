@@ -450,7 +450,7 @@ TEST_F(ZepMediaTest, ALoopDeviceDetachedInTheMiddleStillGetsTheReport) {
 }
 
 // The signal arrives while the report is being written: before the first fsync the file still has its temporary name.
-TEST_F(ZepMediaTest, InterruptedReportLeavesTheMediumUnmountedAndNoPart) {
+TEST_F(ZepMediaTest, InterruptedReportLeavesTheMediumUnmountedWithoutAPart) {
   MakeImage(fDir.Path("key"), "whole");
   for (int const signal : {SIGINT, SIGTERM, SIGHUP}) {
     SCOPED_TRACE(signal);

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// Commands beside a real DHCP server, in namespaces of their own (run-in-netns.sh).
+// Commands with a real DHCP server, in namespaces of their own (run-in-netns.sh).
 
 #include "tests/Support.h"
 
@@ -39,8 +39,8 @@ protected:
       NEEDS(IsThere(program), std::string("no ") + program + " (package " + package + ")");
   }
 
-  // What the shell command printed within the namespaces, and its exit status. `settings` are those of run-in-netns.sh, and
-  // whatever else is to be in the environment: "WPAD_SERVER=none ".
+  // Runs the shell command within the namespaces; returns its output and exit status. `settings` are variables for
+  // run-in-netns.sh and for the command, such as "WPAD_SERVER=none ".
   struct TRun {
     int status;
     std::string output, errors;
@@ -54,7 +54,7 @@ protected:
     return {WIFEXITED(status) ? WEXITSTATUS(status) : -1, ReadFile(fDir.Path("out")), ReadFile(fDir.Path("err"))};
   }
 
-  // The same of a command that succeeds.
+  // The output of a command that must succeed.
   std::string Inside(std::string const& settings, std::string const& command) {
     TRun const run = RunInside(settings, command);
     EXPECT_EQ(run.status, 0) << run.errors;

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// The discovery of the web proxy beside real DHCP servers, in namespaces of their own (run-in-netns.sh). Where it does not
-// matter how long a wait is, WpadProbe waits a twentieth of it and says so: "(up to 6 s)".
+// The discovery of the web proxy with real DHCP servers, in namespaces of their own (run-in-netns.sh). Where the length of a wait
+// does not matter, WpadProbe waits a twentieth of it and prints "(up to 6 s)".
 
 #include "tests/system/wpad/WpadBed.h"
 
@@ -17,7 +17,7 @@ TLines operator+(TLines left, TLines const& right) {
   return left;
 }
 
-// What WpadProbe printed.
+// The output of WpadProbe.
 struct TDiscovery {
   std::string url;
   long milliseconds = -1;
@@ -62,16 +62,16 @@ protected:
 
 std::string const kRecorded = "WPAD_SERVER=bytes WPAD_REPLY=" ZEP_TEST_DATA_DIR "/wpad/reply-kea.hex ";
 
-// ---- Answers ----
+// ---- Replies ----
 
-TEST_F(WpadTest, TheServersAnswerIsTheResult) {
+TEST_F(WpadTest, UrlInTheReplyIsReturned) {
   TDiscovery const found = Discover("");
   EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
   EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kFound);
 }
 
-// The least of some, as another test may run beside this one. The server itself answers within a millisecond or two.
-TEST_F(WpadTest, AnAnsweredDiscoveryEndsAsSoonAsTheAnswerIsIn) {
+// The shortest of several runs, because other tests may run at the same time. The server replies within two milliseconds.
+TEST_F(WpadTest, DiscoveryEndsWhenTheReplyArrives) {
   TLines const lines = LinesOf(Inside("", "for _ in 1 2 3 4 5; do $PROBE start | sed -n 2p; done"));
   ASSERT_EQ(lines.size(), 5u);
   long least = 1000000;
@@ -80,18 +80,18 @@ TEST_F(WpadTest, AnAnsweredDiscoveryEndsAsSoonAsTheAnswerIsIn) {
   EXPECT_LE(least, kIsSanitized ? 1000 : 50);
 }
 
-TEST_F(WpadTest, ALongUrlIsTakenWhole) {
+TEST_F(WpadTest, LongUrlIsReturnedInFull) {
   std::string const url = "http://wpad.test/" + std::string(190, 'x');
   EXPECT_EQ(Discover("WPAD_URL=" + url).url, url);
 }
 
-TEST_F(WpadTest, AnAnswerWithoutTheOptionEndsTheAttemptsAndIsNone) {
+TEST_F(WpadTest, ReplyWithoutTheOptionEndsTheQueryWithoutAUrl) {
   TDiscovery const found = DiscoverInHurry("WPAD_URL=-");
   EXPECT_EQ(found.url, "");
   EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kWaits + kShows);
 }
 
-TEST_F(WpadTest, EveryAttemptSendsTheWholeMessageAndTheThirdMayBeAnswered) {
+TEST_F(WpadTest, EveryAttemptSendsTheMessageAndTheThirdMayBeAnswered) {
   TLines const lines = LinesOf(Inside("ZEP_WPAD_HURRY=1 WPAD_SKIP=2 " + kRecorded,
                                       "tr -d : < /sys/class/net/eth0/address; $PROBE start; cat $ZEP_WPAD_LOG"));
   TLines const log = kStops + kUp + kAsks4 + kUnheard + kUnheard + kWaits + kFound;
@@ -110,7 +110,7 @@ TEST_F(WpadTest, EveryAttemptSendsTheWholeMessageAndTheThirdMayBeAnswered) {
   EXPECT_EQ(TLines(lines.end() - 4, lines.end()), (TLines{"listening", message, message, message}));
 }
 
-TEST_F(WpadTest, WhateverComesIsAReply) {
+TEST_F(WpadTest, AnyPacketIsAReply) {
   struct {
     char const* what;
     std::string reply;
@@ -134,7 +134,7 @@ TEST_F(WpadTest, WhateverComesIsAReply) {
   }
 }
 
-TEST_F(WpadTest, AServerThatAnswersToTheSendersPortIsNeverHeard) {
+TEST_F(WpadTest, ReplyToTheSendersPortIsNotReceived) {
   std::string const output = Inside("ZEP_WPAD_HURRY=1 WPAD_SERVER=dnsmasq", "$PROBE start; grep -c DHCPACK $ZEP_WPAD_LOG");
   TLines lines = LinesOf(output);
   EXPECT_EQ(lines.back(), "3");
@@ -142,9 +142,9 @@ TEST_F(WpadTest, AServerThatAnswersToTheSendersPortIsNeverHeard) {
   EXPECT_EQ(TLines(lines.begin() + 2, lines.end() - 1), kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows);
 }
 
-// ---- No answer ----
+// ---- No reply ----
 
-TEST_F(WpadTest, NoAnswerTakesThreeTimesSixSeconds) {
+TEST_F(WpadTest, UnansweredQueryTakesThreeAttemptsOfSixSeconds) {
   TDiscovery const found = Discover("WPAD_SERVER=none");
   EXPECT_EQ(found.url, "");
   EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice({"[Debug] receiving  DHCP message error!"}) + kShows);
@@ -152,11 +152,11 @@ TEST_F(WpadTest, NoAnswerTakesThreeTimesSixSeconds) {
   EXPECT_LE(found.milliseconds, 23500);  // the kernel rounds each wait up; a fourth would make it 24 s
 }
 
-TEST_F(WpadTest, WithoutARouteNothingIsSent) {
+TEST_F(WpadTest, NothingIsSentWithoutARoute) {
   EXPECT_EQ(DiscoverInHurry("WPAD_ROUTE=none").log, kStops + kUp + kAsks4 + Thrice(kUnsent) + kShows);
 }
 
-TEST_F(WpadTest, ATakenPortIsWaitedForAndThenNothingIsHeard) {
+TEST_F(WpadTest, PortInUseIsRetriedAndThenNoReplyIsReceived) {
   TDiscovery const found = DiscoverInHurry("", R"sh(
     python3 -c 'import socket, time; s = socket.socket(socket.AF_INET, socket.SOCK_DGRAM); s.bind(("", 68)); time.sleep(60)' &
     for _ in $(seq 100); do [ -n "$(ss -Hlnu 'sport = :68')" ] && break; sleep 0.05; done)sh");
@@ -169,35 +169,35 @@ TEST_F(WpadTest, ATakenPortIsWaitedForAndThenNothingIsHeard) {
 
 // ---- Interfaces ----
 
-TEST_F(WpadTest, TheSecondInterfaceIsAskedForWhenTheFirstIsNotAnswered) {
+TEST_F(WpadTest, SecondInterfaceIsQueriedWhenTheFirstGetsNoReply) {
   TDiscovery const found = DiscoverInHurry("WPAD_FIRST=up WPAD_NAME=eth1");
   EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
   EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice(kUnheard) + kUp + kAsks4 + kWaits + kFound);
 }
 
-TEST_F(WpadTest, AnInterfaceThatIsDownIsAskedForAllTheSame) {
+TEST_F(WpadTest, InterfaceThatIsDownIsQueried) {
   TDiscovery const found = DiscoverInHurry("WPAD_FIRST=down WPAD_NAME=eth1");
   EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
   EXPECT_EQ(found.log, kStops + kDown + kAsks4 + Thrice(kUnheard) + kUp + kAsks4 + kWaits + kFound);
 }
 
-TEST_F(WpadTest, APromiscuousInterfaceIsSaidToBe) {
+TEST_F(WpadTest, PromiscuousInterfaceIsLogged) {
   EXPECT_EQ(Discover("", "ip link set eth0 promisc on").log,
             kStops + TLines{"[Debug] the interface is PROMISC!"} + kUp + kAsks4 + kFound);
 }
 
-TEST_F(WpadTest, AnInterfaceOfSeveralAddressesIsAskedForOnce) {
+TEST_F(WpadTest, InterfaceWithSeveralAddressesIsQueriedOnce) {
   EXPECT_EQ(DiscoverInHurry("WPAD_SERVER=none", "ip addr add 10.88.0.2/24 dev eth0").log,
             kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows);
 }
 
-TEST_F(WpadTest, AnInterfaceOfAnotherNameIsNotAskedFor) {
+TEST_F(WpadTest, InterfaceWithAnotherNameIsNotQueried) {
   TDiscovery const found = Discover("WPAD_NAME=net0");
   EXPECT_EQ(found.url, "");
   EXPECT_EQ(found.log, kStops + kShows);
 }
 
-TEST_F(WpadTest, WhatTheSystemDoesNotTellEndsTheInterface) {
+TEST_F(WpadTest, InterfaceThatCannotBeReadIsSkipped) {
   struct {
     char const* settings;
     TLines log;
@@ -215,7 +215,7 @@ TEST_F(WpadTest, WhatTheSystemDoesNotTellEndsTheInterface) {
   }
 }
 
-TEST_F(WpadTest, NothingIsThrownWhereNothingCanBeOpened) {
+TEST_F(WpadTest, NothingIsThrownWhenNoSocketCanBeOpened) {
   if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs descriptors of its own";
   TLines const noPipe = {"[Debug] ERROR: SpawnProcess - pipe call failed!"};
   TDiscovery const found = Discover("ZEP_WPAD_NO_DESCRIPTORS=1");
@@ -223,15 +223,15 @@ TEST_F(WpadTest, NothingIsThrownWhereNothingCanBeOpened) {
   EXPECT_EQ(found.log, kStops + noPipe + TLines{"[Debug] cpm: send socket error!"} + kShows + noPipe);
 }
 
-// ---- The second round ----
+// ---- The query with an IPv6 address ----
 
-TEST_F(WpadTest, AnIPV6AddressIsFoundInWhatBusyboxPrints) {
+TEST_F(WpadTest, IPV6AddressIsFoundInTheOutputOfBusybox) {
   TDiscovery const found = DiscoverInHurry("WPAD_SERVER=none WPAD_IFCONFIG=busybox");
   EXPECT_EQ(found.url, "");
   EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows + kAsks6 + Thrice(kUnheard));
 }
 
-TEST_F(WpadTest, TheIPV6RoundTellsNoAddressAndTheHardwareAddressReadLast) {
+TEST_F(WpadTest, IPV6QueryHasNoAddressAndTheHardwareAddressReadLast) {
   TLines const lines = LinesOf(Inside("ZEP_WPAD_HURRY=1 WPAD_IFCONFIG=busybox WPAD_SKIP=3 " + kRecorded,
                                       "tr -d : < /sys/class/net/eth0/address; $PROBE start; cat $ZEP_WPAD_LOG"));
   TLines const log = kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows + kAsks6 + kWaits + kFoundBy6;
@@ -242,19 +242,19 @@ TEST_F(WpadTest, TheIPV6RoundTellsNoAddressAndTheHardwareAddressReadLast) {
   EXPECT_EQ(lines.back().size(), 2 * 1472u);
 }
 
-// The interface that the server knows is none of those asked for; without an address in the message it answers to the sender.
-TEST_F(WpadTest, TheIPV6RoundMayBeAnsweredByARealServer) {
+// The server does not serve any of the queried interfaces. Without an address in the message it replies to the sender.
+TEST_F(WpadTest, IPV6QueryIsAnsweredByARealServer) {
   TDiscovery const found = DiscoverInHurry("WPAD_IFCONFIG=busybox WPAD_FIRST=up WPAD_NAME=net1");
   EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
   EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows + kAsks6 + kWaits + kFoundBy6);
 }
 
-TEST_F(WpadTest, TheIPV6RoundNeedsNoInterface) {
+TEST_F(WpadTest, IPV6QueryNeedsNoInterface) {
   TDiscovery const found = DiscoverInHurry("WPAD_IFCONFIG=busybox WPAD_NAME=net0 WPAD_ROUTE=none");
   EXPECT_EQ(found.log, kStops + kShows + kAsks6 + TLines{"[Debug] invalid MAC Format!"} + Thrice(kUnsent));
 }
 
-TEST_F(WpadTest, TheAddressEndsAtItsPrefixLengthOrABlank) {
+TEST_F(WpadTest, AddressEndsAtItsPrefixLengthOrABlank) {
   for (std::string const shown : {"x inet6 addr: fd77::2/64 Scope:Link", "inet6 addr: fd77::2", "inet6 addr: fd77::2 /64",
                                   "inet6 addr: fd77::2/64\ninet6 addr: rubbish", "inet6 fe80::9\ninet6 addr: fd77::2\n"}) {
     SCOPED_TRACE(shown);
@@ -279,7 +279,7 @@ TEST_F(WpadTest, DhcpClientsAreEnded) {
   EXPECT_EQ(TLines(lines.begin() + 3, lines.end()), (kStops + TLines{"dhclien", "/dev/nul"}));
 }
 
-TEST_F(WpadTest, WhatTheKillSaysLandsInAFile) {
+TEST_F(WpadTest, OutputOfKillGoesToAFile) {
   EXPECT_NE(Inside("", R"sh(
     mkdir /dev/shm/bin; printf '#!/bin/sh\necho "   99999 ? 00:00:00 dhclient"' > /dev/shm/bin/ps; chmod +x /dev/shm/bin/ps
     PATH=/dev/shm/bin:$PATH $PROBE stop; cat /dev/nul)sh")
@@ -287,21 +287,21 @@ TEST_F(WpadTest, WhatTheKillSaysLandsInAFile) {
             std::string::npos);
 }
 
-TEST_F(WpadTest, WhereThatFileCannotBeMadeNothingIsEnded) {
+TEST_F(WpadTest, NothingIsEndedWhenThatFileCannotBeCreated) {
   TLines const lines = LinesOf(
       Inside("WPAD_DHCLIENT=1",
              "mkdir /dev/nul; until ps -e | grep -q dhclient; do sleep 0.02; done; $PROBE stop; ps -e -o comm= | grep dhclient"));
   EXPECT_EQ(lines.back(), "dhclient");
 }
 
-TEST_F(WpadTest, ALineWithoutANumberEndsNothing) {
+TEST_F(WpadTest, LineWithoutANumberEndsNothing) {
   TLines const lines = LinesOf(Inside("", R"sh(
     mkdir /dev/shm/bin; printf '#!/bin/sh\necho "dhclient; touch /dev/shm/run"; echo; echo "  ? dhclient"' > /dev/shm/bin/ps
     chmod +x /dev/shm/bin/ps; PATH=/dev/shm/bin:$PATH $PROBE stop; ls /dev/shm; ls /dev/nul 2>&1 | grep -c 'No such file')sh"));
   EXPECT_EQ(TLines(lines.end() - 2, lines.end()), (TLines{"bin", "1"}));
 }
 
-TEST_F(WpadTest, WithoutThePrograms) {
+TEST_F(WpadTest, MissingProgramsEndNothingAndShowNoAddress) {
   TDiscovery const found = Discover("WPAD_DHCLIENT=1 WPAD_URL=-", "PATH=/nowhere");
   EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kShows);
 }

@@ -13,13 +13,13 @@
 namespace NQRVZEP20 {
 namespace {
 
-std::string const kTable = "Interface         Address           Sent            Came back\n";
+std::string const kTable = "Interface         Address           Sent            Reply\n";
 std::string const kWillEnd =
     "This ends the DHCP clients of this machine: every process with \"dhclient\" in its line of \"ps -e\".\n";
 
 class ZepWpadTest : public TWpadBed {
 protected:
-  // The times that are measured become "N ms".
+  // Measured times become "N ms".
   TRun Zep(std::string const& settings, std::string const& command) {
     TRun run = RunInside(settings, command);
     run.output = std::regex_replace(run.output, std::regex("[0-9]+ ms"), "N ms");
@@ -34,7 +34,7 @@ protected:
 // zep waits a twentieth of the time.
 std::string const kInHurry = "LD_PRELOAD=$HURRY ";
 
-TEST_F(ZepWpadTest, PrintsTheUrlAndWhatWasSentAndCameBack) {
+TEST_F(ZepWpadTest, PrintsTheUrlTheMessagesAndTheReplies) {
   TRun const run = Zep("", "$ZEP wpad --yes");
   EXPECT_EQ(run.status, 0);
   EXPECT_EQ(run.output, "http://wpad.test/wpad.dat\n\n" + kTable +
@@ -53,18 +53,18 @@ TEST_F(ZepWpadTest, PrintsJson) {
   EXPECT_EQ(document["failure"], nullptr);
   EXPECT_FALSE(document.contains("file"));
   ASSERT_EQ(document["interfaces"].size(), 1u);
-  nlohmann::json const& asking = document["interfaces"][0];
-  EXPECT_EQ(asking["interface"], "eth0");
-  EXPECT_EQ(asking["up"], true);
-  EXPECT_EQ(asking["promiscuous"], false);
-  EXPECT_EQ(asking["address"], "10.77.0.2");
-  EXPECT_EQ(asking["hardwareAddress"].get<std::string>().size(), 17u);
-  EXPECT_EQ(asking["sent"], 1);
-  EXPECT_EQ(asking["reply"]["bytes"], 300);
-  EXPECT_EQ(asking["reply"]["from"], "10.77.0.1");
-  EXPECT_LT(asking["reply"]["milliseconds"], 5000);
-  EXPECT_EQ(asking["reply"]["url"], "http://wpad.test/wpad.dat");
-  EXPECT_EQ(asking["failure"], nullptr);
+  nlohmann::json const& query = document["interfaces"][0];
+  EXPECT_EQ(query["interface"], "eth0");
+  EXPECT_EQ(query["up"], true);
+  EXPECT_EQ(query["promiscuous"], false);
+  EXPECT_EQ(query["address"], "10.77.0.2");
+  EXPECT_EQ(query["hardwareAddress"].get<std::string>().size(), 17u);
+  EXPECT_EQ(query["sent"], 1);
+  EXPECT_EQ(query["reply"]["bytes"], 300);
+  EXPECT_EQ(query["reply"]["from"], "10.77.0.1");
+  EXPECT_LT(query["reply"]["milliseconds"], 5000);
+  EXPECT_EQ(query["reply"]["url"], "http://wpad.test/wpad.dat");
+  EXPECT_EQ(query["failure"], nullptr);
 }
 
 // ---- DHCP clients ----
@@ -72,7 +72,7 @@ TEST_F(ZepWpadTest, PrintsJson) {
 std::string const kOnceItRuns = "until ps -e | grep -q dhclient; do sleep 0.02; done; ";
 std::string const kIsItThere = "; sleep 0.3; ps -e -o comm= | grep -c dhclient; true";
 
-TEST_F(ZepWpadTest, SaysThatDhcpClientsWillBeEndedAndAsks) {
+TEST_F(ZepWpadTest, ListsTheDhcpClientsAndAsksForConfirmation) {
   struct {
     char const* what;
     std::string command;
@@ -97,15 +97,15 @@ TEST_F(ZepWpadTest, SaysThatDhcpClientsWillBeEndedAndAsks) {
   }
 }
 
-TEST_F(ZepWpadTest, UnconfirmedIsNothing) { EXPECT_EQ(Zep("", "echo n | $ZEP wpad").status, 1); }
+TEST_F(ZepWpadTest, WithoutConfirmationNothingIsDone) { EXPECT_EQ(Zep("", "echo n | $ZEP wpad").status, 1); }
 
-TEST_F(ZepWpadTest, YesIsSaidOnTheCommandLine) {
+TEST_F(ZepWpadTest, OptionYesConfirms) {
   TRun const run = Zep("WPAD_DHCLIENT=1", kOnceItRuns + "$ZEP wpad --yes" + kIsItThere);
   EXPECT_EQ(LinesOf(run.output).back(), "0");
   EXPECT_EQ(run.errors.find("Continue?"), std::string::npos) << run.errors;
 }
 
-// A name with a line break in it is two lines for BusyBox.
+// BusyBox prints a name with a line break as two lines.
 std::string const kForgedLine =
     "mkdir $TMPDIR/bin && ln -s $(command -v busybox) $TMPDIR/bin/ps && export PATH=$TMPDIR/bin:$PATH; "
     "sleep 100 & victim=$!; "
@@ -113,7 +113,7 @@ std::string const kForgedLine =
     "$victim & until ps -e | grep -q \"^ *$victim dhclient\"; do sleep 0.02; done; ";
 std::string const kDoesItLive = "; echo $?; kill -0 $victim && echo lives";
 
-TEST_F(ZepWpadTest, ALineThatNamesAnotherProcessIsRefused) {
+TEST_F(ZepWpadTest, LineOfAnotherProcessIsRefused) {
   std::string const settings = "TMPDIR=" + fDir.Path() + " ";
   for (std::string const command : {"$ZEP wpad --yes", "echo y | $ZEP wpad"}) {
     std::filesystem::remove_all(fDir.Path("bin"));
@@ -121,15 +121,15 @@ TEST_F(ZepWpadTest, ALineThatNamesAnotherProcessIsRefused) {
     EXPECT_EQ(run.output, "1\nlives\n");
     EXPECT_NE(std::regex_search(run.errors,
                                 std::regex("zep: the line \" *[0-9]+ dhclient.*\" of \"ps -e\" is wrong: process [0-9]+ "
-                                           "is \"sleep\"\\. Nothing was ended\\. Another process may forge the line .* "
-                                           "/proc/PID/comm and end that process\\. --no-stop leaves the DHCP clients alone\n")),
+                                           "is \"sleep\"\\. Nothing was ended\\. Another process may have forged the line .* "
+                                           "/proc/PID/comm and end that process\\. --no-stop leaves the DHCP clients running\n")),
               false)
         << run.errors;
   }
 }
 
-// Numbers that "kill" takes for those of processes and /proc does not, in lines that differ each time.
-TEST_F(ZepWpadTest, ANumberWithLeadingZerosIsRefused) {
+// Numbers that "kill" accepts and /proc does not, in lines that differ each time.
+TEST_F(ZepWpadTest, NumberWithLeadingZerosIsRefused) {
   std::string const forging =
       "mkdir $TMPDIR/bin && export PATH=$TMPDIR/bin:$PATH; sleep 100 & victim=$!; "
       "printf '#!/bin/sh\necho \"0%s $(cat /proc/uptime) dhclient\"\nsleep 0.05\n' $victim > $TMPDIR/bin/ps; "
@@ -141,7 +141,7 @@ TEST_F(ZepWpadTest, ANumberWithLeadingZerosIsRefused) {
       << run.errors;
 }
 
-TEST_F(ZepWpadTest, DhcpClientsAreLeftAloneWhenAsked) {
+TEST_F(ZepWpadTest, OptionNoStopLeavesTheDhcpClientsRunning) {
   TRun const run = Zep("WPAD_DHCLIENT=1", kOnceItRuns + "$ZEP wpad --no-stop" + kIsItThere);
   EXPECT_EQ(LinesOf(run.output).front(), "http://wpad.test/wpad.dat");
   EXPECT_EQ(LinesOf(run.output).back(), "1");
@@ -154,7 +154,7 @@ TEST_F(ZepWpadTest, DhcpClientsAreLeftAloneWhenAsked) {
 TEST_F(ZepWpadTest, NoAnswer) {
   TRun const run = Zep("WPAD_SERVER=none", kInHurry + "$ZEP wpad --no-stop");
   EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.output, kTable + "eth0              10.77.0.2         3 x 1472 bytes  nothing within 18 s\n");
+  EXPECT_EQ(run.output, kTable + "eth0              10.77.0.2         3 x 1472 bytes  none within 18 s\n");
   EXPECT_EQ(run.errors, "zep: no server returned a proxy configuration URL\n");
 }
 
@@ -172,7 +172,7 @@ TEST_F(ZepWpadTest, AnAnswerWithoutAUrl) {
   EXPECT_FALSE(document.contains("file"));
 }
 
-TEST_F(ZepWpadTest, SaysOfEachInterfaceWhatBecameOfIt) {
+TEST_F(ZepWpadTest, PrintsTheResultForEachInterface) {
   struct {
     char const* settings;
     char const* before;
@@ -180,7 +180,7 @@ TEST_F(ZepWpadTest, SaysOfEachInterfaceWhatBecameOfIt) {
     char const* errors;
   } const rows[] = {
       {"WPAD_FIRST=up WPAD_NAME=eth1", "",
-       "eth0              10.99.0.2         3 x 1472 bytes  nothing within 18 s\n"
+       "eth0              10.99.0.2         3 x 1472 bytes  none within 18 s\n"
        "eth1              10.77.0.2         1 x 1472 bytes  300 bytes from 10.77.0.1\n"
        "                                                    after N ms, with the URL\n",
        ""},
@@ -196,7 +196,7 @@ TEST_F(ZepWpadTest, SaysOfEachInterfaceWhatBecameOfIt) {
       {"WPAD_FIRST=up WPAD_NAME=net1",
        "mkdir /dev/shm/bin; printf '#!/bin/sh\\necho inet6 addr: fd77::2/64' > /dev/shm/bin/ifconfig; "
        "chmod +x /dev/shm/bin/ifconfig; export PATH=/dev/shm/bin:$PATH; ",
-       "eth0              10.99.0.2         3 x 1472 bytes  nothing within 18 s\n"
+       "eth0              10.99.0.2         3 x 1472 bytes  none within 18 s\n"
        "IPv6              fd77::2           1 x 1472 bytes  300 bytes from 10.77.0.1\n"
        "                                                    after N ms, with the URL\n",
        ""},
@@ -212,16 +212,17 @@ TEST_F(ZepWpadTest, SaysOfEachInterfaceWhatBecameOfIt) {
   }
 }
 
-TEST_F(ZepWpadTest, APortThatStaysTakenEndsTheSearch) {
+TEST_F(ZepWpadTest, PortThatStaysInUseEndsTheSearch) {
   TRun const run = Zep("WPAD_FIRST=up WPAD_NAME=eth1", R"sh(
     python3 -c 'import socket, time; s = socket.socket(socket.AF_INET, socket.SOCK_DGRAM); s.bind(("", 68)); time.sleep(60)' &
     for _ in $(seq 100); do [ -n "$(ss -Hlnu 'sport = :68')" ] && break; sleep 0.05; done
     LD_PRELOAD=$HURRY $ZEP wpad --no-stop)sh");
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, kTable +
-                            "eth0              10.99.0.2         nothing         another program holds port\n"
-                            "                                                    68\n");
-  EXPECT_EQ(run.errors, "zep: another program holds port 68; trying again for up to 30 s\nzep: another program holds port 68\n");
+                            "eth0              10.99.0.2         nothing         another program is using\n"
+                            "                                                    port 68\n");
+  EXPECT_EQ(run.errors,
+            "zep: another program is using port 68; trying again for up to 30 s\nzep: another program is using port 68\n");
 }
 
 TEST_F(ZepWpadTest, OnlyRootMayListen) {
@@ -230,15 +231,15 @@ TEST_F(ZepWpadTest, OnlyRootMayListen) {
     setpriv --reuid=65534 --regid=65534 --clear-groups /dev/shm/zep/bin/zep wpad --yes)sh");
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: zep wpad needs root: nobody else may listen on port 68\n");
+  EXPECT_EQ(run.errors, "zep: zep wpad must be run as root: only root may listen on port 68\n");
 }
 
-TEST_F(ZepWpadTest, ATerminalShowsACountdown) {
+TEST_F(ZepWpadTest, TerminalShowsACountdown) {
   TRun const run = Zep("WPAD_SERVER=none", kInHurry + "script -qec '$ZEP wpad --no-stop' /dev/null < /dev/null");
   for (int left = 18; left > 0; --left)
-    EXPECT_NE(run.output.find("\rWaiting for an answer to 10.77.0.2: " + std::to_string(left) + " s left"), std::string::npos)
+    EXPECT_NE(run.output.find("\rWaiting for a reply to 10.77.0.2: " + std::to_string(left) + " s left"), std::string::npos)
         << left << " in " << run.output;
-  std::string const wiped = '\r' + std::string(std::string("Waiting for an answer to 10.77.0.2: 18 s left").size(), ' ') + '\r';
+  std::string const wiped = '\r' + std::string(std::string("Waiting for a reply to 10.77.0.2: 18 s left").size(), ' ') + '\r';
   EXPECT_NE(run.output.find(wiped + "Interface"), std::string::npos) << run.output;
 }
 
@@ -259,7 +260,7 @@ TEST_F(ZepWpadTest, FetchesTheFile) {
   EXPECT_EQ(document["file"], (nlohmann::json{{"text", kFile}, {"failure", nullptr}}));
 }
 
-TEST_F(ZepWpadTest, SaysWhyThereIsNoFile) {
+TEST_F(ZepWpadTest, PrintsWhyTheFileWasNotFetched) {
   NEEDS(IsCurlThere(), "no libcurl (package libcurl4)");
   struct {
     char const* settings;
@@ -268,8 +269,8 @@ TEST_F(ZepWpadTest, SaysWhyThereIsNoFile) {
   } const rows[] = {
       {"WPAD_URL=http://wpad.test/missing", "", "The requested URL returned error: 404"},
       {"WPAD_URL=http://nowhere.test/wpad.dat", "", "Could not resolve host: nowhere.test"},
-      {"WPAD_URL=file:///etc/hostname", "", "only files of plain HTTP are fetched"},
-      {"WPAD_URL=https://wpad.test/wpad.dat", "", "only files of plain HTTP are fetched"},
+      {"WPAD_URL=file:///etc/hostname", "", "only plain HTTP (http://) is supported"},
+      {"WPAD_URL=https://wpad.test/wpad.dat", "", "only plain HTTP (http://) is supported"},
       {"", "mount --bind /dev/null \"$(readlink -f \"$(ldconfig -p | awk '/libcurl\\.so\\.4 /{print $NF; exit}')\")\"; ",
        "libcurl cannot be loaded: libcurl.so.2: cannot open shared object file: No such file or directory; install the package "
        "libcurl4"},
@@ -286,7 +287,7 @@ TEST_F(ZepWpadTest, SaysWhyThereIsNoFile) {
   }
 }
 
-TEST_F(ZepWpadTest, TheFileHasAGreatestSize) {
+TEST_F(ZepWpadTest, FileSizeIsLimited) {
   NEEDS(IsCurlThere(), "no libcurl (package libcurl4)");
   TRun const refused = RunInside("", "$ZEP wpad --no-stop --fetch --max-file 20");
   EXPECT_EQ(refused.status, 2);
@@ -298,7 +299,7 @@ TEST_F(ZepWpadTest, TheFileHasAGreatestSize) {
   }
 }
 
-TEST_F(ZepWpadTest, AUrlIsPrintedAsTextAndLosesItsEnd) {
+TEST_F(ZepWpadTest, UrlIsPrintedWithEscapesAndWithoutItsEnd) {
   // "http://a<escape>[2J", a newline and a zero byte
   std::string const reply = ReplyFile(std::string(2 * 240, '0') + "fc0e" + "687474703a2f2f611b5b324a0a00");
   EXPECT_EQ(LinesOf(Zep(reply, "$ZEP wpad --no-stop").output).front(), "http://a\\x1b[2J");

@@ -4,6 +4,7 @@
 
 #include "TConfig.h"
 #include "TOSSpecific.h"
+#include "os/SettingLine.h"
 #include "tools/zep/commands/Commands.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Json.h"
@@ -47,14 +48,12 @@ struct TSettings {
   bool fIsCut;  // a reading error came before the end
 };
 
-// Why the library ignores a line; empty when it does not. `lineOfKey` has the keys of the lines before it.
-std::string ReasonToIgnore(std::string const& text, std::map<std::string, std::size_t> const& lineOfKey) {
-  std::size_t const equals = text.find('=');
-  if (text.empty()) return "an empty line";
-  if (text.front() == '#') return "a comment";
-  if (equals == 0) return "no key before \"=\"";
-  if (equals == text.size() - 1) return "no value after \"=\"";
-  auto const first = lineOfKey.find(text.substr(0, equals));
+// Why the library ignores a line; empty when it does not. `lineOfKey` has the keys of the lines before.
+std::string ReasonToIgnore(TSettingLine const& line, std::map<std::string, std::size_t> const& lineOfKey) {
+  if (line.fIsComment) return "a comment";
+  if (line.fKey.empty()) return line.fValue.empty() && !line.fHasSeparator ? "an empty line" : "no key before \"=\"";
+  if (line.fValue.empty()) return "no value after \"=\"";
+  auto const first = lineOfKey.find(std::string(line.fKey));
   if (first != lineOfKey.end()) return "line " + std::to_string(first->second) + " sets the key, and the first counts";
   return "";
 }
@@ -70,8 +69,9 @@ TSettings ReadSettings() {
   if (IsReadByTheLibrary()) file.open(kFileName);
   std::string text;
   for (std::size_t line = 1; std::getline(file, text); ++line) {
-    std::string const key = text.substr(0, text.find('='));
-    std::string const reason = ReasonToIgnore(text, lineOfKey);
+    TSettingLine const setting = ReadSettingLine(text);
+    std::string const key(setting.fKey);
+    std::string const reason = ReasonToIgnore(setting, lineOfKey);
     if (reason.empty())
       lineOfKey[key] = line;
     else

@@ -4,6 +4,7 @@
 
 #include "AutoProxyDiscovery.h"
 #include "TOSSpecific.h"
+#include "proxy/WpadQuery.h"
 #include "tools/zep/commands/Commands.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Json.h"
@@ -74,9 +75,9 @@ public:
   ~TCountdown() {
     if (fWidth > 0) std::cerr << '\r' << std::string(fWidth, ' ') << '\r' << std::flush;
   }
-  void Show(TAsking const& asking, int secondsLeft) {
+  void Show(TQuery const& query, int secondsLeft) {
     if (!CanRedrawErrors()) return;
-    std::string text = "Waiting for an answer to " + asking.fAddress + ": " + std::to_string(secondsLeft) + " s left";
+    std::string text = "Waiting for a reply to " + query.fAddress + ": " + std::to_string(secondsLeft) + " s left";
     text.resize(std::max(text.size(), fWidth), ' ');
     fWidth = text.size();
     std::cerr << '\r' << text << std::flush;
@@ -88,23 +89,23 @@ private:
 
 // ---- Output ----
 
-std::string NameOf(TAsking const& asking) {
-  if (asking.fInterface.empty()) return "IPv6";
-  return asking.fInterface + (asking.fIsUp ? "" : ", down") + (asking.fIsPromiscuous ? ", promiscuous" : "");
+std::string NameOf(TQuery const& query) {
+  if (query.fInterface.empty()) return "IPv6";
+  return query.fInterface + (query.fIsUp ? "" : ", down") + (query.fIsPromiscuous ? ", promiscuous" : "");
 }
 
-std::string ReplyOf(TAsking const& asking) {
-  if (asking.fReply) {
-    TReply const& reply = *asking.fReply;
+std::string ReplyOf(TQuery const& query) {
+  if (query.fReply) {
+    TReply const& reply = *query.fReply;
     return std::to_string(reply.fSize) + " bytes from " + reply.fSender + " after " + std::to_string(reply.fMilliseconds) +
-           " ms, " + (asking.fUrl.empty() ? "without a URL" : "with the URL");
+           " ms, " + (query.fUrl.empty() ? "without a URL" : "with the URL");
   }
-  return asking.fFailure.empty() ? "nothing within " + std::to_string(kReplySeconds * asking.fSent) + " s" : asking.fFailure;
+  return query.fFailure.empty() ? "none within " + std::to_string(kWpadReplySeconds * query.fSent) + " s" : query.fFailure;
 }
 
-std::string MessagesOf(TAsking const& asking) {
-  if (asking.fSent == 0) return "nothing";
-  return std::to_string(asking.fSent) + " x " + std::to_string(AutoProxyDiscovery::kMessageSize) + " bytes";
+std::string MessagesOf(TQuery const& query) {
+  if (query.fSent == 0) return "nothing";
+  return std::to_string(query.fSent) + " x " + std::to_string(AutoProxyDiscovery::kMessageSize) + " bytes";
 }
 
 // The lines of a file from the network, made safe for a terminal.
@@ -121,11 +122,11 @@ std::string PrintableLines(std::string const& text) {
 std::string AsText(TFindings const& findings) {
   std::string text;
   if (!findings.fSearch.fUrl.empty()) text += Printable(findings.fSearch.fUrl) + "\n";
-  if (!findings.fSearch.fAskings.empty()) {
+  if (!findings.fSearch.fQueries.empty()) {
     TTable table({16, 16, 14, 28});
-    table.Add({"Interface", "Address", "Sent", "Came back"});
-    for (TAsking const& asking : findings.fSearch.fAskings)
-      table.Add({NameOf(asking), asking.fAddress, MessagesOf(asking), ReplyOf(asking)});
+    table.Add({"Interface", "Address", "Sent", "Reply"});
+    for (TQuery const& query : findings.fSearch.fQueries)
+      table.Add({NameOf(query), query.fAddress, MessagesOf(query), ReplyOf(query)});
     text += (text.empty() ? "" : "\n") + table.GetText();
   }
   if (findings.fPacFile && findings.fPacFile->fFailure.empty()) text += "\n" + PrintableLines(findings.fPacFile->fText);
@@ -137,24 +138,24 @@ std::string WhyIncomplete(TFindings const& findings) {
   if (findings.fPacFile && !findings.fPacFile->fFailure.empty())
     return "the file was not fetched: " + findings.fPacFile->fFailure;
   if (!findings.fSearch.fUrl.empty()) return "";
-  if (findings.fSearch.fAskings.empty()) return "no interface has a name that begins with \"eth\"";
+  if (findings.fSearch.fQueries.empty()) return "no interface has a name that begins with \"eth\"";
   return findings.fSearch.fFailure.empty() ? "no server returned a proxy configuration URL" : findings.fSearch.fFailure;
 }
 
-TJson AskingAsJson(TAsking const& asking) {
-  TJson json = {{"interface", OrNull(asking.fInterface)}};
-  json["up"] = asking.fInterface.empty() ? TJson(nullptr) : TJson(asking.fIsUp);
-  json["promiscuous"] = asking.fInterface.empty() ? TJson(nullptr) : TJson(asking.fIsPromiscuous);
-  json["address"] = OrNull(asking.fAddress);
-  json["hardwareAddress"] = OrNull(asking.fHardwareAddress);
-  json["sent"] = asking.fSent;
+TJson QueryAsJson(TQuery const& query) {
+  TJson json = {{"interface", OrNull(query.fInterface)}};
+  json["up"] = query.fInterface.empty() ? TJson(nullptr) : TJson(query.fIsUp);
+  json["promiscuous"] = query.fInterface.empty() ? TJson(nullptr) : TJson(query.fIsPromiscuous);
+  json["address"] = OrNull(query.fAddress);
+  json["hardwareAddress"] = OrNull(query.fHardwareAddress);
+  json["sent"] = query.fSent;
   json["reply"] = nullptr;
-  if (asking.fReply)
-    json["reply"] = {{"bytes", asking.fReply->fSize},
-                     {"from", asking.fReply->fSender},
-                     {"milliseconds", asking.fReply->fMilliseconds},
-                     {"url", OrNull(asking.fUrl)}};
-  json["failure"] = OrNull(asking.fFailure);
+  if (query.fReply)
+    json["reply"] = {{"bytes", query.fReply->fSize},
+                     {"from", query.fReply->fSender},
+                     {"milliseconds", query.fReply->fMilliseconds},
+                     {"url", OrNull(query.fUrl)}};
+  json["failure"] = OrNull(query.fFailure);
   return json;
 }
 
@@ -165,7 +166,7 @@ std::string AsJson(TFindings const& findings) {
   document["stoppedClients"] = findings.fStoppedClients;
   document["messageBytes"] = AutoProxyDiscovery::kMessageSize;
   document["interfaces"] = TJson::array();
-  for (TAsking const& asking : findings.fSearch.fAskings) document["interfaces"].push_back(AskingAsJson(asking));
+  for (TQuery const& query : findings.fSearch.fQueries) document["interfaces"].push_back(QueryAsJson(query));
   document["failure"] = OrNull(findings.fSearch.fFailure);
   if (findings.fPacFile) {
     bool const isThere = findings.fPacFile->fFailure.empty();
@@ -193,9 +194,9 @@ bool StopClients(bool isConfirmed) {
 }
 
 TSearch Search() {
-  if (IsPortTaken()) std::cerr << "zep: another program holds port 68; trying again for up to 30 s\n";
+  if (IsPortTaken()) std::cerr << "zep: another program is using port 68; trying again for up to 30 s\n";
   TCountdown countdown;
-  return SearchProxy([&](TAsking const& asking, int secondsLeft) { countdown.Show(asking, secondsLeft); });
+  return SearchProxy([&](TQuery const& query, int secondsLeft) { countdown.Show(query, secondsLeft); });
 }
 
 void Tell(TFindings const& findings, bool asJson) {

@@ -2,6 +2,7 @@
 #include "tools/zep/media/Media.h"
 
 #include "TOSSpecific.h"
+#include "os/MediaTexts.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/processes/Descriptor.h"
@@ -40,11 +41,6 @@ bool FlagOf(TJson const& node, char const* key) {
 bool IsRemovable(TJson const& drive) {
   std::string const type = TextOf(drive, "type");
   return (type == "disk" || type == "rom") && (FlagOf(drive, "rm") || TextOf(drive, "tran") == "usb");
-}
-
-std::string Trimmed(std::string const& text) {
-  std::size_t const first = text.find_first_not_of(' ');
-  return first == text.npos ? "" : text.substr(first, text.find_last_not_of(' ') - first + 1);
 }
 
 std::string DescriptionOf(TJson const& drive) {

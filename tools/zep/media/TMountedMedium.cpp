@@ -3,6 +3,7 @@
 
 #include "TOSSpecific.h"
 #include "TZEPException.h"
+#include "os/MediaTexts.h"
 #include "tools/zep/media/Drives.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Text.h"
@@ -34,11 +35,6 @@ void ThrowIf(bool hasFailed, std::string const& what) {
 }
 
 // ---- Mounting ----
-
-std::string MountPointOf(std::string const& device) {
-  bool const isFloppy = device == "/dev/floppy" || device == "/dev/fd0" || device == "/dev/fd1";
-  return isFloppy ? "/mnt/floppy" : "/mnt/key";
-}
 
 // What the library tries to mount when the device itself cannot be mounted.
 std::string FirstPartitionOf(std::string const& device) { return device + "1"; }

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/transfer/Transfer.h"
 
+#include "os/RemotePath.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/Terminal.h"
@@ -153,10 +154,8 @@ void AddName(TRemote& remote, std::string const& name) {
 
 // Where the file arrives: on bootable media the library chooses the directory of a host.
 TRemote PlaceOf(TTarget const& target) {
-  char const* const isBootable = std::getenv("ZEP_ISBOOTABLE");
   TRemote place = target.fRemote;
-  if (target.fIsHost && isBootable && std::string(isBootable) == "yes")
-    place.fPath = "hostline/toqrv/vantor/fdr_upload/" + place.fPath;
+  if (target.fIsHost) place.fPath = RemotePathOf(place.fPath);
   return place;
 }
 

@@ -16,19 +16,19 @@ namespace {
 constexpr char const* kName = "dhclient";
 constexpr int kSilenceSeconds = 300;
 
-// As the library reads it; empty when the line begins with none.
+// The number at the start of the line, as the library reads it; empty when there is none.
 std::string ProcessNumberOf(std::string const& line) {
   std::size_t const start = std::min(line.find_first_not_of(' '), line.size());
   return line.substr(start, std::min(line.find_first_not_of("0123456789", start), line.size()) - start);
 }
 
-// Whether a process may have it, as /proc writes it. "kill" understands more: it ends process 7 for "007".
+// Whether it is a process number in the form that /proc uses. "kill" accepts more: for "007" it ends process 7.
 bool IsPlainNumber(std::string const& number) {
   constexpr std::size_t kMostDigits = 7;  // the kernel's largest is 4194304
   return number.front() != '0' && number.size() <= kMostDigits;
 }
 
-// What the process calls itself; nothing where there is none of that number.
+// The name of the process; none when no process has that number.
 std::optional<std::string> NameOfProcess(std::string const& number) {
   std::ifstream file("/proc/" + number + "/comm", std::ios::binary);
   if (!file) return std::nullopt;
@@ -49,19 +49,19 @@ std::vector<std::string> DhcpClientLines() {
 
 namespace {
 
-// By its number: the rest of a forged line may change each time.
+// Compares the number only: the rest of a forged line may differ each time.
 bool IsStillListed(std::string const& number) {
   std::vector<std::string> const lines = DhcpClientLines();
   return std::any_of(lines.begin(), lines.end(), [&](std::string const& line) { return ProcessNumberOf(line) == number; });
 }
 
-// Why the process of that number is not to be ended; empty when it is, or when there is nothing to end.
+// Why the process with that number must not be ended; empty when it may be, or when there is none.
 std::string WhyNotNumber(std::string const& number) {
   if (number.empty()) return "";
   if (!IsPlainNumber(number)) return number + " is not the number of a process";
   std::optional<std::string> const name = NameOfProcess(number);
   if (name) return name->find(kName) != name->npos ? "" : "process " + number + " is \"" + *name + "\"";
-  return IsStillListed(number) ? "there is no process " + number : "";  // else it has ended meanwhile
+  return IsStillListed(number) ? "there is no process " + number : "";  // otherwise it has ended since
 }
 
 }  // namespace
@@ -71,9 +71,8 @@ std::string WhyNotToBeEnded(std::vector<std::string> const& lines) {
     std::string const why = WhyNotNumber(ProcessNumberOf(line));
     if (why.empty()) continue;
     return "the line \"" + line + "\" of \"ps -e\" is wrong: " + why +
-           ". Nothing was ended. Another process may forge the line by a line break in its name: compare \"ps -e\" with the "
-           "names "
-           "in /proc/PID/comm and end that process. --no-stop leaves the DHCP clients alone";
+           ". Nothing was ended. Another process may have forged the line with a line break in its name: compare \"ps -e\" with "
+           "the names in /proc/PID/comm and end that process. --no-stop leaves the DHCP clients running";
   }
   return "";
 }

@@ -6,12 +6,12 @@
 
 namespace NQRVZEP20::zep {
 
-// The lines of "ps -e" that hold "dhclient". The processes whose numbers they begin with are those that
-// AutoProxyDiscovery::wpadPreconfig ends.
+// The lines of "ps -e" that contain "dhclient". AutoProxyDiscovery::wpadPreconfig ends the processes with the numbers at the
+// start of these lines.
 std::vector<std::string> DhcpClientLines();
 
-// Why one of the lines must not be followed, or an empty text. A name with a line break in it makes a line of its own in the
-// output of some "ps", and with it the number of any process. So the process must bear the name itself.
+// Why the process of one of the lines must not be ended; empty when each may be. Some versions of "ps" print a name with a line
+// break as two lines, the second of which can start with the number of any process. So the process itself must have the name.
 std::string WhyNotToBeEnded(std::vector<std::string> const& lines);
 
 }  // namespace NQRVZEP20::zep

@@ -14,14 +14,14 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-// What has come, and whether that was too much.
+// The text received so far, and whether it became too long.
 struct TPage {
   std::string& fText;
   std::uint64_t fMostBytes;  // 0: any number
   bool fIsTooLong = false;
 };
 
-// libcurl's write callback. What is too long is refused, which ends the transfer.
+// libcurl's write callback. A text that is too long is refused, which ends the transfer.
 std::size_t Append(char const* bytes, std::size_t size, std::size_t count, void* context) {
   TPage& page = *static_cast<TPage*>(context);
   page.fIsTooLong = page.fMostBytes > 0 && page.fText.size() + size * count > page.fMostBytes;
@@ -30,10 +30,10 @@ std::size_t Append(char const* bytes, std::size_t size, std::size_t count, void*
   return size * count;
 }
 
-// Empty, or why the file could not be had.
+// Why the file could not be fetched; empty when it was.
 std::string Transfer(TCurl const& curl, std::string const& url, std::uint64_t mostBytes, std::string& text) {
   std::unique_ptr<CURL, decltype(curl_easy_cleanup)*> const transfer(curl.fInit(), curl.fCleanup);
-  if (!transfer) return "libcurl does not start";
+  if (!transfer) return "libcurl cannot be initialised";
   std::array<char, CURL_ERROR_SIZE> error{};
   CURL* const handle = transfer.get();
   curl.fSetOption(handle, CURLOPT_ERRORBUFFER, error.data());
@@ -63,7 +63,7 @@ bool IsPlainHttp(std::string const& url) { return ::strncasecmp(url.c_str(), "ht
 TPacFile FetchPacFile(std::string const& url, std::uint64_t mostBytes) {
   TPacFile file;
   if (!IsPlainHttp(url)) {
-    file.fFailure = "only files of plain HTTP are fetched";
+    file.fFailure = "only plain HTTP (http://) is supported";
     return file;
   }
   TCurl curl;
@@ -72,7 +72,7 @@ TPacFile FetchPacFile(std::string const& url, std::uint64_t mostBytes) {
     return file;
   }
   if (curl.fGlobalInit(CURL_GLOBAL_ALL) != CURLE_OK) {
-    file.fFailure = "libcurl does not start";
+    file.fFailure = "libcurl cannot be initialised";
     return file;
   }
   file.fFailure = Transfer(curl, url, mostBytes, file.fText);

@@ -8,11 +8,11 @@ namespace NQRVZEP20::zep {
 
 struct TPacFile {
   std::string fText;
-  std::string fFailure;  // why there is none; empty when there is
+  std::string fFailure;  // why the file could not be fetched; empty when it was
 };
 
-// Fetches a proxy configuration file through plain HTTP, past every proxy, by the libcurl of the system. At most
-// `mostBytes` (0: any number), and at most 30 seconds.
+// Fetches a proxy configuration file by plain HTTP, without a proxy, with the libcurl of the system: at most `mostBytes` (0: any
+// number), in at most 30 seconds.
 TPacFile FetchPacFile(std::string const& url, std::uint64_t mostBytes);
 
 }  // namespace NQRVZEP20::zep

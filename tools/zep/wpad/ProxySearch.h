@@ -8,44 +8,40 @@
 
 namespace NQRVZEP20::zep {
 
-// How long an answer to one message is waited for.
-constexpr int kReplySeconds = 6;
-
-// What came back.
 struct TReply {
-  std::size_t fSize;
+  std::size_t fSize;  // bytes
   std::string fSender;
-  long fMilliseconds;  // since the message that was sent last
+  long fMilliseconds;  // since the last message was sent
 };
 
-// One interface, or the round with an IPv6 address: what was sent about it, and what came of that.
-struct TAsking {
-  std::string fInterface;  // empty: the IPv6 round
+// The query for one interface, or for an IPv6 address, and its result.
+struct TQuery {
+  std::string fInterface;  // empty: the query for an IPv6 address
   bool fIsUp = true, fIsPromiscuous = false;
   std::string fAddress, fHardwareAddress;
   int fSent = 0;  // messages
   std::optional<TReply> fReply;
-  std::string fUrl;      // of the reply; empty when it names none
-  std::string fFailure;  // why nothing was sent or could come back; empty for a mere silence
+  std::string fUrl;      // in the reply; empty when it contains none
+  std::string fFailure;  // why no message was sent or no reply could arrive; empty when the query was just not answered
 };
 
 struct TSearch {
-  std::vector<TAsking> fAskings;
-  std::string fUrl;      // empty: nobody named one
-  std::string fFailure;  // what ended the search early
+  std::vector<TQuery> fQueries;
+  std::string fUrl;      // empty: no server returned one
+  std::string fFailure;  // why the search ended early
 };
 
-// Told once a second while an answer is waited for: about what, and how many seconds are left of the asking.
-using TOnWait = std::function<void(TAsking const& asking, int secondsLeft)>;
+// Called once a second while the search waits for a reply, with the seconds that are left for the query.
+using TOnWait = std::function<void(TQuery const& query, int secondsLeft)>;
 
-// Why this process can never listen where DHCP servers answer; empty when it can, if only later.
+// Why this process can never listen on the port of DHCP clients; empty when it can, now or later.
 std::string WhyNoListening();
 
-// Whether another program holds the port at this moment.
+// Whether another program is using the port at this moment.
 bool IsPortTaken();
 
-// The discovery of AutoProxyDiscovery::StartWpad, step by step, but for the ending of DHCP clients. And a person does not
-// wait where nothing can come: a message that cannot be sent is not waited for, and a port that stays taken ends it all.
+// Performs the discovery of AutoProxyDiscovery::StartWpad without ending DHCP clients, and does not wait where no reply can
+// arrive: after a message that could not be sent, and when the port stays in use, which ends the search.
 TSearch SearchProxy(TOnWait const& onWait);
 
 }  // namespace NQRVZEP20::zep

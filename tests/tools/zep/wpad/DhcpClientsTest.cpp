@@ -11,7 +11,7 @@
 namespace NQRVZEP20::zep {
 namespace {
 
-// A directory whose program "ps" prints a line with that beginning, and another end each time.
+// A directory whose program "ps" prints a line that starts with the text and ends differently each time.
 class TChangingLine {
 public:
   explicit TChangingLine(std::string const& beginning) : fPath(std::getenv("PATH")) {
@@ -27,7 +27,7 @@ private:
   std::string fPath;
 };
 
-TEST(DhcpClientsTest, OnlyThePlainNumberOfAProcessIsTaken) {
+TEST(DhcpClientsTest, OnlyAPlainProcessNumberIsAccepted) {
   for (std::string const number : {"0", "02", "0000001", "12345678", "4294967298"})
     EXPECT_NE(WhyNotToBeEnded({" " + number + " ? 00:00:00 dhclient"})
                   .find(" is wrong: " + number + " is not the number of a process. Nothing was ended."),
@@ -36,7 +36,7 @@ TEST(DhcpClientsTest, OnlyThePlainNumberOfAProcessIsTaken) {
   EXPECT_EQ(WhyNotToBeEnded({"dhclient without a number"}), "") << "ends nothing";
 }
 
-TEST(DhcpClientsTest, ALineIsTheSameWhoseNumberIs) {
+TEST(DhcpClientsTest, LinesAreComparedByTheirNumber) {
   TChangingLine const line("9999999");  // which no process can have
   std::vector<std::string> const lines = DhcpClientLines();
   ASSERT_EQ(lines.size(), 1u);
