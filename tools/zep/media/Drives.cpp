@@ -17,7 +17,7 @@ std::string TextOf(std::uint64_t number) {
   return std::to_string(::gnu_dev_major(number)) + ":" + std::to_string(::gnu_dev_minor(number));
 }
 
-// Where sysfs has a block device; empty for what it does not know.
+// The path of a block device in sysfs; empty when it has none.
 fs::path PlaceOf(std::uint64_t number) {
   std::error_code error;
   return fs::canonical("/sys/dev/block/" + TextOf(number), error);
@@ -28,7 +28,7 @@ bool IsPartition(fs::path const& place) {
   return !place.empty() && fs::exists(place / "partition", error);
 }
 
-// A volume's slaves are the devices that it is made of.
+// The slaves of a volume are the devices that it consists of.
 void AddDrivesOf(fs::path const& place, TDrives& drives) {
   if (place.empty()) return;
   std::error_code error;
@@ -63,7 +63,7 @@ bool IsPartitionOf(std::string const& partition, std::string const& device) {
 TDrives DrivesOf(TMount const& mount) {
   TDrives drives;
   AddDrivesOf(mount.fDevice, drives);
-  // Some file systems mount under numbers of their own. Other sources than devices may be out of reach, and are not touched.
+  // Some file systems have mount numbers of their own. A source that is not a device may be unreachable and is not accessed.
   if (mount.fSource.rfind("/dev/", 0) == 0) AddDrivesOf(NumberOf(mount.fSource), drives);
   return drives;
 }

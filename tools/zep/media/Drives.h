@@ -10,18 +10,19 @@
 
 namespace NQRVZEP20::zep {
 
-// The number of a block device; 0 for what is none.
+// The number of a block device; 0 for any other file.
 std::uint64_t NumberOf(std::string const& path);
 
-// Whether the kernel knows the one block device as a partition of the other.
+// Whether the first block device is a partition of the second, according to the kernel.
 bool IsPartitionOf(std::string const& partition, std::string const& device);
 
-// What has to be unmounted before it can be taken out: the drives that a mounted file system is on, whether by partitions
-// or by encrypted or logical volumes. For comparing only; a file system that is on no drive has a name here as well.
+// The drives that hold a mounted file system, directly, in partitions, or in encrypted or logical volumes: all that is mounted
+// from them must be unmounted before they can be taken out. For comparison only; a file system without a drive has a name here,
+// too.
 using TDrives = std::set<std::string>;
 TDrives DrivesOf(TMount const& mount);
 
-// Where something of these drives is mounted now.
+// The mount points of these drives.
 std::vector<std::string> MountPointsOf(TDrives const& drives);
 
 }  // namespace NQRVZEP20::zep

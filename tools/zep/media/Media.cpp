@@ -52,7 +52,7 @@ std::string DescriptionOf(TJson const& drive) {
 
 bool IsPartition(TJson const& node) { return TextOf(node, "type") == "part"; }
 
-// Also those of an opened encrypted or logical volume, which is a child of what it is on.
+// Includes those of an opened encrypted or logical volume, which is a child of its partition.
 void AddMountPoints(TJson const& node, std::vector<std::string>& mountPoints) {
   for (TJson const& mountPoint : node.value("mountpoints", TJson::array()))
     if (mountPoint.is_string()) mountPoints.push_back(mountPoint);
@@ -73,7 +73,7 @@ TMedium MediumFrom(TJson const& node, std::string const& description) {
   return medium;
 }
 
-// The drive itself where it has no partitions, or a file system beside them, and every partition.
+// The drive itself, when it has no partitions or a file system of its own, and every partition.
 void AddMediaOf(TJson const& drive, std::vector<TMedium>& media) {
   TJson const children = drive.value("children", TJson::array());
   TMedium const whole = MediumFrom(drive, DescriptionOf(drive));
@@ -82,7 +82,7 @@ void AddMediaOf(TJson const& drive, std::vector<TMedium>& media) {
     if (IsPartition(child)) media.push_back(MediumFrom(child, whole.fDescription));
 }
 
-// Whether an optical drive is empty, which is asked for in a way that leaves its tray where it is.
+// Whether an optical drive is empty. The query does not move its tray.
 bool IsEmptyDrive(TMedium const& medium) {
   if (!medium.fIsOptical) return false;
   TDescriptor const drive(::open(medium.fDevice.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
@@ -123,7 +123,7 @@ std::string WithoutTrailingSlashes(std::string name) {
 }
 
 void CheckDevice(std::string const& device) {
-  if (device.find('@') != device.npos) throw TWrongUsage("that is not a name of a device");  // it may have a password in it
+  if (device.find('@') != device.npos) throw TWrongUsage("that is not a name of a device");  // it may contain a password
   if (device.rfind("/dev/", 0) != 0 || !IsPlainPath(device))
     throw TWrongUsage("\"" + device +
                       "\" is not a name of a device: below /dev, of letters, digits, \"/\", \"-\", \"_\" and \".\"");
@@ -131,7 +131,7 @@ void CheckDevice(std::string const& device) {
 }
 
 std::vector<TMedium> MediaIn(std::string const& lsblkOutput) {
-  std::size_t const start = lsblkOutput.find('{');  // behind warnings
+  std::size_t const start = lsblkOutput.find('{');  // after warnings
   TJson const document = TJson::parse(start == lsblkOutput.npos ? "" : lsblkOutput.substr(start), nullptr, false);
   if (!document.is_object() || !document.contains("blockdevices") || !document["blockdevices"].is_array())
     throw std::runtime_error("lsblk printed something else than its list: " + lsblkOutput);
@@ -159,7 +159,7 @@ std::vector<TMedium> FindMedia() {
   std::vector<TMedium> media = MediaIn(output);
   media.erase(std::remove_if(media.begin(), media.end(), IsEmptyDrive), media.end());
 
-  // lsblk knows of labels what udev has told; where there is no udev, root reads them.
+  // lsblk gets labels from udev. Without udev, root reads them.
   if (!HasUdev() && TOSSpecific::IsAdmin())
     for (TMedium& medium : media)
       ReadLabel(TOSSpecific::SpawnProcess("blkid", {"-p", "-o", "export", medium.fDevice}, kTimeoutSeconds), medium);

@@ -10,17 +10,18 @@ namespace NQRVZEP20::zep {
 
 // ---- Names ----
 
-// Whether a name can be handed to the library, which puts it into a command of the shell as it is: only letters, digits,
-// "/", "-", "_" and ".", an absolute path, and none of its parts "." or "..".
+// Whether a name can be passed to the library, which inserts it into a shell command verbatim: an absolute path of letters,
+// digits,
+// "/", "-", "_" and ".", without the parts "." and "..".
 bool IsPlainPath(std::string const& name);
 
 // "/mnt/key" for "/mnt/key/"; "/" stays.
 std::string WithoutTrailingSlashes(std::string name);
 
-// Throws TWrongUsage for a name that is no plain path below /dev, std::runtime_error for a device that is not there.
+// Throws TWrongUsage for a name that is not a plain path below /dev, std::runtime_error for a device that does not exist.
 void CheckDevice(std::string const& device);
 
-// ---- What is there ----
+// ---- Media and mounts ----
 
 // A removable medium, or a partition of one, that can hold a file system.
 struct TMedium {
@@ -29,21 +30,21 @@ struct TMedium {
   std::string fLabel, fFileSystem;
   std::uint64_t fSize;  // in bytes
   bool fIsReadOnly;
-  std::vector<std::string> fMountPoints;  // also those of the encrypted and logical volumes on it; none when it is not mounted
+  std::vector<std::string> fMountPoints;  // of its encrypted and logical volumes, too; none when it is not mounted
   bool fIsOptical;
 };
 
-// The media that the output of "lsblk --json" shows, of disks and drives that are removable or on the USB. Throws
-// std::runtime_error for what is no such output.
+// The media in the output of "lsblk --json", of disks and drives that are removable or connected by USB. Throws
+// std::runtime_error for any other output.
 std::vector<TMedium> MediaIn(std::string const& lsblkOutput);
 
 // Label and file system in the output of "blkid -o export".
 void ReadLabel(std::string const& blkidOutput, TMedium& medium);
 
-// Those of this machine.
+// The media of this machine.
 std::vector<TMedium> FindMedia();
 
-// Labels and file systems are read by root, or by udev for everyone.
+// Whether this user can see labels and file systems: root reads them, and udev publishes them for everyone.
 bool AreLabelsReadable();
 
 struct TMount {
@@ -53,11 +54,11 @@ struct TMount {
   bool fIsReadOnly;
 };
 
-// Everything that is mounted, as /proc/self/mountinfo has it.
+// All mounts, in the order of /proc/self/mountinfo.
 std::vector<TMount> MountsIn(std::string const& mountInfo);
 std::vector<TMount> Mounts();
 
-// What is mounted at exactly that directory, the topmost where there are several.
+// The mount at exactly that directory; the topmost when there are several.
 std::optional<TMount> MountIn(std::string const& mountInfo, std::string const& directory);
 std::optional<TMount> MountAt(std::string const& directory);
 

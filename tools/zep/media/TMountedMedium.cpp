@@ -36,10 +36,10 @@ void ThrowIf(bool hasFailed, std::string const& what) {
 
 // ---- Mounting ----
 
-// What the library tries to mount when the device itself cannot be mounted.
+// The device that the library tries to mount when the device itself cannot be mounted.
 std::string FirstPartitionOf(std::string const& device) { return device + "1"; }
 
-// Some file systems mount under numbers of their own.
+// Some file systems have mount numbers of their own.
 bool IsMountOf(std::string const& node, TMount const& mount) {
   std::uint64_t const number = NumberOf(node);
   return number != 0 && (number == mount.fDevice || number == NumberOf(mount.fSource));
@@ -55,14 +55,14 @@ void RefuseOther(std::optional<TMount> const& mount, std::string const& mountPoi
   if (mount && !IsOf(*mount, device)) Throw(mountPoint + " holds " + mount->fSource + "; unmount that first");
 }
 
-// "/dev/sdb11" is no first partition of "/dev/sdb1".
+// "/dev/sdb11" is not the first partition of "/dev/sdb1".
 void RefuseStranger(std::string const& device) {
   std::string const next = FirstPartitionOf(device);
   if (NumberOf(next) != 0 && !IsPartitionOf(next, device))
     Throw(device + " is not mounted: " + next + ", which would be tried as well, is not a partition of it");
 }
 
-// The library runs it by the shell, and takes its absence for a medium that cannot be read.
+// The library runs the program by the shell; a missing program looks like a medium that cannot be read.
 void NeedProgram(std::string const& name) {
   char const* const path = std::getenv("PATH");
   std::istringstream directories(path != nullptr ? path : "");
@@ -94,7 +94,7 @@ TMount MountOrThrow(std::string const& device, std::string const& mountPoint) {
   return *mount;
 }
 
-// Where media are mounted; nothing else is to be unmounted by a slip of the fingers.
+// The directories where media are mounted: a mistyped name must not unmount another file system.
 void CheckDirectory(std::string const& directory) {
   auto const isBelow = [&](char const* place) { return directory.rfind(place, 0) == 0; };
   if (IsPlainPath(directory) && (isBelow("/mnt/") || isBelow("/media/") || isBelow("/run/media/"))) return;
@@ -105,7 +105,7 @@ void CheckDirectory(std::string const& directory) {
 
 // ---- Writing ----
 
-// To a name that nothing has yet. Some file systems in user space cannot see to that by themselves.
+// To a name that does not exist yet. Some file systems in user space cannot ensure this themselves.
 void RenameToNew(int directory, std::string const& from, std::string const& to, std::string const& what) {
   if (::renameat2(directory, from.c_str(), directory, to.c_str(), RENAME_NOREPLACE) == 0) return;
   ThrowIf(errno != EINVAL && errno != ENOSYS, what);
@@ -113,7 +113,7 @@ void RenameToNew(int directory, std::string const& from, std::string const& to, 
   ThrowIf(errno != ENOENT || ::renameat(directory, from.c_str(), directory, to.c_str()) != 0, what);
 }
 
-// Some file systems cannot be asked to sync a directory; syncing the whole of them then has to do.
+// Some file systems cannot sync a directory; the complete file system is synced then.
 void SyncDirectory(int directory, std::string const& what) {
   ThrowIf(::fsync(directory) != 0 && errno != EINVAL, what);
   ThrowIf(::syncfs(directory) != 0, what);
@@ -160,7 +160,7 @@ std::vector<std::string> UnmountDirectory(std::string const& directory) {
   NeedProgram("umount");
 
   TDrives const drives = DrivesOf(*mount);
-  // Opened before: it then tells of what could not be written while unmounting.
+  // Opened before unmounting: its fsync then reports data that could not be written.
   TDescriptor const source = Open(AT_FDCWD, mount->fSource, O_RDONLY | O_NONBLOCK);
   try {
     TInterruptsBlocked const blocked;

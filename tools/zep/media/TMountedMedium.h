@@ -7,11 +7,12 @@
 
 namespace NQRVZEP20::zep {
 
-// A medium that the library has mounted. Everything throws std::runtime_error with the reason, TWrongUsage for a name.
+// A medium that the library has mounted. Every function throws std::runtime_error with the reason, or TWrongUsage for a wrong
+// name.
 class TMountedMedium {
 public:
-  // Mounts the device at the library's mount point for it, which is made when it is missing. One that is mounted there
-  // already will do; another one there is an error.
+  // Mounts the device at the library's mount point for it, which is created when it is missing. A device that is already mounted
+  // there is accepted; another one there is an error.
   explicit TMountedMedium(std::string const& device);
 
   std::string const& Device() const { return fMount.fSource; }  // what is mounted: the device or its first partition
@@ -26,9 +27,8 @@ private:
   TMount fMount;
 };
 
-// Unmounts what is mounted at a directory below /mnt, /media or /run/media (TWrongUsage for any other). When it returns,
-// everything is on the medium. The result is where the medium, or another partition of it, is mounted still: none when it
-// can be taken out.
+// Unmounts the medium at a directory below /mnt, /media or /run/media (TWrongUsage for any other). When it returns, all data are
+// on the medium. Returns where the medium, or another partition of it, is still mounted: none when it can be taken out.
 std::vector<std::string> UnmountDirectory(std::string const& directory);
 
 // "can be taken out", or "is still mounted at /media/a".

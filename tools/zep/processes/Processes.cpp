@@ -22,7 +22,7 @@ struct TProcess {
   TProcessResult fResult;
 };
 
-// Waits until one of the processes says something, or the time of one is up.
+// Waits until one of the processes writes output or reaches its time limit.
 std::vector<pollfd> WaitForAny(std::vector<TProcess> const& running) {
   std::vector<pollfd> polled;
   TClock::time_point next = TClock::time_point::max();
@@ -36,7 +36,7 @@ std::vector<pollfd> WaitForAny(std::vector<TProcess> const& running) {
   return polled;
 }
 
-// False when it has ended, as it may have done when it says something; its result is whole then.
+// False when it has ended, which it may have when output is readable; its result is complete then.
 bool GoesOn(TProcess& process, bool saysSomething) {
   if (saysSomething && !process.fChild.Read(process.fResult.fOutput)) {
     process.fResult.fIsComplete = process.fChild.End();
@@ -48,7 +48,7 @@ bool GoesOn(TProcess& process, bool saysSomething) {
   return false;
 }
 
-// The items: those that are worked on, and how many of all have been taken up.
+// The items in progress, and how many have been started.
 class TItems {
 public:
   using TDone = std::function<void(TProcessResult const&)>;
@@ -56,20 +56,20 @@ public:
   TItems(std::size_t count, TProcessLimits const& limits, TWork const& work, TDone const& done)
       : fCount(count), fLimits(limits), fWork(work), fDone(done) {}
 
-  // As many as may be worked on at once, or as there is room for. One that finds none though no other is worked on is done.
+  // Starts as many as allowed, or as possible. When none can be started although no other is running, the item is finished.
   void TakeUp() {
     while (fNext < fCount && fRunning.size() < fLimits.fParallel) try {
         Start(fNext);
         ++fNext;
       } catch (std::system_error const&) {
-        if (!fRunning.empty()) return;  // there may be room again when one of them has ended
+        if (!fRunning.empty()) return;  // another may be possible when one of them has ended
         fDone({fNext++, false, false, {}});
       }
   }
 
   bool IsAnyRunning() const { return !fRunning.empty(); }
 
-  // Waits until something happens to those that run, and hands on the results of those that have ended.
+  // Waits for an event of a running process, and passes on the results of those that have ended.
   void Follow() {
     std::vector<pollfd> const polled = WaitForAny(fRunning);
     std::vector<TProcess> stillRunning;

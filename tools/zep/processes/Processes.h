@@ -12,7 +12,7 @@ namespace NQRVZEP20::zep {
 struct TProcessResult {
   std::size_t fItem;
   bool fIsComplete;     // false: the child did not finish, and fOutput is what it had sent by then
-  bool fIsTimeUp;       // it was ended because its time was up
+  bool fIsTimeUp;       // it was ended at its time limit
   std::string fOutput;  // everything that it sent
 };
 

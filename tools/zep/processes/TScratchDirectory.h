@@ -5,10 +5,10 @@
 
 namespace NQRVZEP20::zep {
 
-// A fresh directory among the temporary files, removed with everything in it at the end, unless it is to be kept.
+// A new temporary directory. It is removed with its contents at the end unless Keep was called.
 class TScratchDirectory {
 public:
-  // Its name begins with this one. Throws std::system_error when none can be made.
+  // Its name begins with `name`. Throws std::system_error when it cannot be created.
   explicit TScratchDirectory(std::string const& name);
   ~TScratchDirectory();
   TScratchDirectory(TScratchDirectory const&) = delete;

@@ -43,7 +43,7 @@ std::optional<TSecret>& PasswordOfEnvironment() {
   return password;
 }
 
-// While it lives, the signals that end or stop a program wait; each that came has its effect at the end.
+// Holds back the signals that end or stop a program; each one that arrived has its effect at the end.
 class TSignalsLater {
 public:
   TSignalsLater() {
@@ -56,14 +56,14 @@ public:
   TSignalsLater(TSignalsLater const&) = delete;
   TSignalsLater& operator=(TSignalsLater const&) = delete;
 
-  int File() const { return fFile.Get(); }  // readable when one has come; below 0 when none can be had
+  int File() const { return fFile.Get(); }  // readable when one has arrived; below 0 when it could not be opened
 
 private:
   sigset_t fSignals, fBefore;
   TDescriptor fFile;
 };
 
-// The terminal of the process, which shows nothing of what is typed as long as this lives.
+// The terminal of the process. It does not echo input while this exists.
 class TQuietTerminal {
 public:
   explicit TQuietTerminal(std::string const& otherwise) : fFile(::open("/dev/tty", O_RDWR | O_CLOEXEC)) {
@@ -102,7 +102,7 @@ private:
   termios fSettings;
 };
 
-// Nothing when a signal came, which has its effect before this returns.
+// Empty after a signal, which has had its effect when this returns.
 std::optional<TSecret> AskOnce(std::string const& owner, std::string const& otherwise) {
   TSignalsLater const signals;
   TQuietTerminal const terminal(otherwise);
@@ -125,7 +125,7 @@ void TakePasswordOutOfTheEnvironment(bool isNeeded) {
 
 TSecret TypedPassword(std::string const& owner, std::string const& otherwise) {
   std::optional<TSecret> password;
-  while (!password) {  // again when zep was stopped and goes on
+  while (!password) {  // again after zep was stopped and continued
     password = AskOnce(owner, otherwise);
     ThrowIfInterrupted();
   }

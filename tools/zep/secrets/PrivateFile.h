@@ -10,7 +10,7 @@
 
 namespace NQRVZEP20::zep {
 
-// A file with passwords, read whole into memory that is overwritten at the end.
+// A file with passwords, read completely into memory that is overwritten at the end.
 class TPrivateFile {
 public:
   // A file that cannot be read to its end, or is longer than 1 MiB, leaves the text empty, with the reason in Error().
@@ -18,9 +18,9 @@ public:
 
   std::string_view Text() const { return {fText.data(), fText.size()}; }
   int Error() const { return fError; }  // errno; EFBIG for a file that is too long, 0 when it was read
-  std::string Reason() const;           // the same in words
+  std::string Reason() const;           // the same as a text
 
-  // A warning on standard error, once for a path, when it is a regular file that every user may read.
+  // Warns on standard error, once for each path, when it is a regular file that every user may read.
   void WarnWhenOthersMayRead() const;
 
 private:
@@ -30,7 +30,7 @@ private:
   mode_t fMode = 0;
 };
 
-// A file for messages. What names nothing may be a password in the place of the file; the option is named instead.
+// The name of a file in messages. A name without a file may be a password in the wrong place: the option is named instead.
 std::string NameOfPrivateFile(std::string const& path, std::string const& option);
 
 }  // namespace NQRVZEP20::zep

@@ -20,10 +20,10 @@ namespace {
 constexpr std::string_view kStars = "***";
 constexpr std::string_view kPrefix = "zep: ";
 constexpr std::string_view kBlanks = " \t\r\n\v\f";
-// What ends a URL in a text, besides a blank.
+// Characters that end a URL in a text, besides a blank.
 constexpr std::string_view kEndsOfUrl = "\"'<>`{}|\\^";
 
-// Each as it is, and in the forms that libraries and servers write. The longest come first: one may be part of another.
+// Each one verbatim and in the forms that libraries and servers use. The longest come first: one may be part of another.
 std::vector<TSecretBytes>& AllSecrets() {
   static std::vector<TSecretBytes> secrets;
   return secrets;
@@ -46,7 +46,7 @@ void AddForm(std::string&& form) {
 std::string Base64Of(std::string_view text) {
   constexpr char const* kDigits = "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789+/";
   std::string encoded;
-  encoded.reserve((text.size() + 2) / 3 * 4);  // so that it leaves no piece elsewhere
+  encoded.reserve((text.size() + 2) / 3 * 4);  // so that no part remains in freed memory
   for (std::size_t at = 0; at < text.size(); at += 3) {
     auto const byte = [&](std::size_t i) { return i < text.size() ? static_cast<unsigned char>(text[i]) : 0u; };
     unsigned const bits = byte(at) << 16 | byte(at + 1) << 8 | byte(at + 2);
@@ -91,14 +91,14 @@ void Replace(std::string& text, std::string_view secret) {
   HideSpans(text, spans);
 }
 
-// The colon behind the user (or the host), none of those in an IPv6 address.
+// The colon after the user (or the host), not one in an IPv6 address.
 std::size_t ColonOf(std::string_view word) {
   bool const hasBracket = !word.empty() && word.front() == '[';
   return word.find(':', hasBracket ? std::min(word.find(']'), word.size()) : 0);
 }
 
-// In "user:secret@host/path". A password with a "/" in it is one too, though nobody can tell it from a port and a path:
-// "u:1/x@h".
+// In "user:secret@host/path". A password that contains "/" is hidden, too, although it cannot be distinguished from a port and a
+// path: "u:1/x@h".
 TSpan SpanInPlace(std::string_view place) {
   std::string_view const authority = place.substr(0, place.find('/'));
   std::size_t const colon = ColonOf(place);
@@ -120,7 +120,7 @@ bool IsUserCharacter(char c) {
 // "Host:CIM_Chassis.Tag="a@b"" names an object.
 bool IsObjectPath(std::string_view word) { return word.find("=\"") != word.npos; }
 
-// Of a word without a scheme: in `proxy="user:secret@host:8080"`, say. A mail address is none.
+// In a word without a scheme, such as `proxy="user:secret@host:8080"`. A mail address has no password.
 TSpan SpanInBareWord(std::string_view word) {
   std::size_t const colon = word.find(':');
   if (colon == word.npos || IsObjectPath(word)) return {};
@@ -143,7 +143,7 @@ void ReplaceInUrls(std::string& text) {
     TSpan const span = SpanInPlace(std::string_view(text).substr(at, end - at));
     if (span.fSize == 0) continue;
     spans.push_back({at + span.fStart, span.fSize});
-    at = spans.back().fStart + span.fSize;  // a "://" within a password begins no further one
+    at = spans.back().fStart + span.fSize;  // a "://" within a password does not start another URL
   }
   HideSpans(text, spans);
 }
@@ -161,7 +161,7 @@ void ReplaceInBareWords(std::string& text) {
   HideSpans(text, spans);
 }
 
-// std::cerr's, which holds back a line until it is whole: a password may be written in pieces.
+// The buffer of std::cerr. It holds back a line until it is complete, because a password may be written in parts.
 class TErrorBuffer : public std::streambuf {
 public:
   ~TErrorBuffer() override { TErrorBuffer::sync(); }
@@ -180,7 +180,7 @@ protected:
   }
   int sync() override {
     std::string const line = std::exchange(fLine, "");
-    std::size_t const start = line.rfind(kPrefix, 0) == 0 ? kPrefix.size() : 0;  // no password, though it may be the same word
+    std::size_t const start = line.rfind(kPrefix, 0) == 0 ? kPrefix.size() : 0;  // not a password, even if it is the same word
     WriteWhole(STDERR_FILENO, line.substr(0, start) + MessageWithoutSecrets(line.substr(start)));
     return 0;
   }
@@ -190,7 +190,7 @@ private:
 };
 
 TErrorBuffer& ErrorBuffer() {
-  AllSecrets();  // made first, so that it outlives the buffer, which looks at it at the end of the program
+  AllSecrets();  // created first, so that it outlives the buffer, which reads it at the end of the program
   static TErrorBuffer buffer;
   return buffer;
 }
@@ -217,7 +217,7 @@ void HideIn(std::string_view word) {
   if (span.fSize == 0) return;
   std::string_view const secret = word.substr(start + span.fStart, span.fSize);
   TSecret const hidden(secret), decoded = SecretOf(Decoded(secret));
-  // Taken for a path, one with a "/" in it comes back in pieces.
+  // A password that contains "/" may have been read as a path, whose parts are printed separately.
   std::size_t const slash = secret.rfind('/');
   if (slash != secret.npos) TSecret const piece(secret.substr(slash + 1));
 }

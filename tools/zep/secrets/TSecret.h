@@ -9,7 +9,7 @@
 
 namespace NQRVZEP20::zep {
 
-// Overwrites the bytes, which the compiler does not leave out.
+// Overwrites the bytes; the compiler cannot optimise this away.
 void Wipe(void* bytes, std::size_t size);
 
 struct THeap {
@@ -17,7 +17,7 @@ struct THeap {
   static void GiveBack(void* memory, std::size_t) { ::operator delete(memory); }
 };
 
-// Memory that is overwritten before it is given back.
+// Memory that is overwritten before it is freed.
 template <class T, class TUpstream = THeap>
 struct TWipingAllocator {
   using value_type = T;
@@ -39,8 +39,8 @@ using TSecretBytes = std::vector<char, TWipingAllocator<char>>;
 
 // A password. Copies are deep, and each is overwritten at its end.
 //
-// The first one that is not empty closes the process, and the children that it makes without an exec, to other processes of
-// the same user: no core dump, no ptrace, no look at the memory. Each one is hidden in what zep prints (Secrets.h).
+// The first one that is not empty protects the process, and its children without an exec, from other processes of the same user:
+// no core dump, no ptrace, no access to the memory. Each one is hidden in the output of zep (Secrets.h).
 class TSecret {
 public:
   TSecret() = default;
@@ -49,14 +49,14 @@ public:
   bool IsEmpty() const { return fBytes.empty(); }
   std::string_view View() const { return {fBytes.data(), fBytes.size()}; }
 
-  // For the library, which takes nothing else: an ordinary text, for use in a child that ends after it only.
+  // An ordinary text for the library, which accepts nothing else. Use it only in a child that ends afterwards.
   std::string ForLibrary() const { return std::string(View()); }
 
 private:
   TSecretBytes fBytes;
 };
 
-// The secret in an ordinary text, which is overwritten.
+// The secret in `text`, which is overwritten.
 TSecret SecretOf(std::string&& text);
 
 }  // namespace NQRVZEP20::zep
