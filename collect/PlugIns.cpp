@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/PlugIns.h"
 
-#include "ILogger.h"
 #include "INamespaceProvider.h"
 #include "TOSSpecific.h"
 #include "TRootObject.h"
+#include "TZEPFailure.h"
 #include "collect/FailureOf.h"
 
 #include <algorithm>
@@ -28,34 +28,26 @@ TProviders RegisteredProviders() {
   return providers;
 }
 
-// As FailureOf, and how long it took.
+// Why a piece of work failed: both texts are empty when it succeeded, and the reason also when the failure carries none.
+struct TTimedFailure {
+  std::string fMessage, fReason;
+};
+
+// Runs the work as FailureOf does, and measures how long it takes.
 template <class TWork>
-std::string TimedFailureOf(TWork work, double& milliseconds) {
+TTimedFailure TimedFailureOf(TWork work, double& milliseconds) {
   auto const start = std::chrono::steady_clock::now();
-  std::string failure = FailureOf(work);
+  TTimedFailure failure;
+  failure.fMessage = FailureOf([&] {
+    try {
+      work();
+    } catch (TZEPFailure const& thrown) {
+      failure.fReason = thrown.Reason();
+      throw;
+    }
+  });
   milliseconds = std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() - start).count();
   return failure;
-}
-
-// The dynamic linker's reason, which the library writes to the log before it throws.
-std::string LinkerReason(std::string const& plugIn, std::string const& otherwise) {
-  std::string const start = "Couldn't load NSP: " + plugIn + " (";
-  auto const& entries = TRootObject::GetCoreLogger()->GetLog();
-  for (auto entry = entries.rbegin(); entry != entries.rend(); ++entry) {
-    std::string const& message = entry->fMessage;
-    if (message.compare(0, start.size(), start) == 0) return message.substr(start.size(), message.size() - start.size() - 1);
-  }
-  return otherwise;
-}
-
-// The last error that the log has behind the entries that it had before, in brackets; an exception alone does not tell where.
-std::string ErrorLoggedSince(std::size_t entriesBefore) {
-  auto const& entries = TRootObject::GetCoreLogger()->GetLog();
-  std::string error;
-  std::size_t at = 0;
-  for (ILogger::TLogEntry const& entry : entries)
-    if (at++ >= entriesBefore && entry.fSeverity == ILogger::kLogError) error = " (" + entry.fMessage + ")";
-  return error;
 }
 
 TProviderRun Fill(std::string const& name, boost::shared_ptr<INamespaceProvider> provider, std::string const& sampleLabel) {
@@ -65,17 +57,16 @@ TProviderRun Fill(std::string const& name, boost::shared_ptr<INamespaceProvider>
     if (!ns) throw std::runtime_error("it has no namespace");
     run.fView = std::make_shared<TNamespaceView>(name, ns, sampleLabel);
   };
-  std::size_t const entries = TRootObject::GetCoreLogger()->GetLog().size();
-  run.fError = TimedFailureOf(fill, run.fMilliseconds);
-  if (!run.fError.empty()) run.fError += ErrorLoggedSince(entries);
+  TTimedFailure const failure = TimedFailureOf(fill, run.fMilliseconds);
+  run.fError = failure.fReason.empty() ? failure.fMessage : failure.fMessage + " (" + failure.fReason + ")";
   return run;
 }
 
 TPlugIn Load(std::string const& name, std::string const& sampleLabel) {
   TPlugIn plugIn{name, PlugInDirectory() + TOSSpecific::kFileSeparator + "lib" + name + kNSPExtension, 0, "", {}};
   TProviders const before = RegisteredProviders();
-  plugIn.fError = TimedFailureOf([&] { TOSSpecific::LoadNSPLibrary(name); }, plugIn.fMilliseconds);
-  if (!plugIn.fError.empty()) plugIn.fError = LinkerReason(name, plugIn.fError);
+  TTimedFailure const failure = TimedFailureOf([&] { TOSSpecific::LoadNSPLibrary(name); }, plugIn.fMilliseconds);
+  plugIn.fError = failure.fReason.empty() ? failure.fMessage : failure.fReason;  // of the dynamic linker
 
   for (auto const& [providerName, provider] : RegisteredProviders())
     if (before.count(providerName) == 0) plugIn.fProviders.push_back(Fill(providerName, provider, sampleLabel));

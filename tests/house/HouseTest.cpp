@@ -41,7 +41,8 @@ TRoom const kRooms[] = {
     {"providers/mof", {"include", "providers/memory"}},
     {"providers/host", {"include", "providers/memory", "providers/reasons", "platform/include"}},
     {"collect", {"include", "providers/memory", "providers/mof", "providers/reasons"}},
-    {"tools/zep", {"include", "providers/memory", "providers/mof", "providers/reasons", "collect"}},
+    {"tools/zep",
+     {"include", "core", "loaders", "os", "proxy", "providers/memory", "providers/mof", "providers/reasons", "collect"}},
 };
 
 fs::path const kSource = ZEP_SOURCE_DIR;

@@ -2,7 +2,8 @@
 
 // zep proxy-check: whether a web proxy lets a request through.
 
-#include "TOSSpecific.h"
+#include "TZEPFailure.h"
+#include "os/ProxyCheck.h"
 #include "tools/zep/commands/Commands.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Output.h"
@@ -72,7 +73,14 @@ bool IsCutAt(std::string const& file, std::uint64_t mostBytes) {
   return mostBytes > 0 && std::filesystem::file_size(file, absent) >= mostBytes && !absent;
 }
 
-// Replaces libcurl's message, which the library passes on and which names no remedy.
+// Fetches the page into the working directory.
+TZEPStatusCode FetchPage(TRemote const& proxy) {
+  TProxyAnswer const answer = CheckProxy(proxy.fHost, proxy.fPort, UserAndPasswordOf(proxy));
+  if (answer.fStatus == kZEPStatusOK) return kZEPStatusOK;
+  throw TZEPFailure(answer.fStatus, answer.fReason.empty() ? "libcurl reports no reason" : answer.fReason);
+}
+
+// Replaces libcurl's message, which names no remedy.
 void ExplainNoConnection(TOutcome& outcome, TRemote const& proxy) {
   constexpr int kProbeSeconds = 3;
   std::string const why = WhyUnreachable(proxy.fHost, proxy.fPort, kProbeSeconds);
@@ -90,7 +98,7 @@ TOutcome Check(TRemote const& proxy, TArguments const& arguments) {
   TOutcome outcome = RunWatched(
       [&] {
         std::filesystem::current_path(scratch.Path());
-        return TOSSpecific::CheckProxySetting(proxy.fHost, proxy.fPort, UserAndPasswordOf(proxy), 0);
+        return FetchPage(proxy);
       },
       watch);
   bool const isCut = outcome.fExit == kExitNothing && IsCutAt(pageFile, arguments.fMostBytes);
