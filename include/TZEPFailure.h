@@ -9,9 +9,9 @@
 
 namespace NQRVZEP20 {
 
-// A TZEPException that also carries the reason for the failure, as a text for people. The library throws it wherever a header
-// states that a failure is logged and thrown: the reason is that of the log line. TCIMCopy throws it without a line. A plug-in
-// may throw it, too. Code that catches TZEPException catches it as well:
+// A TZEPException that also carries the reason for the failure, as a text for people. The library throws it where a header
+// states that a failure is logged and thrown; the reason is then the text of the log line. TCIMCopy throws it without logging.
+// Plug-ins may throw it. Code that catches TZEPException catches it as well:
 //
 //   } catch (TZEPFailure const& failure) {
 //     std::cerr << failure.what() << ": " << failure.Reason() << "\n";

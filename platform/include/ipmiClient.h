@@ -17,7 +17,7 @@
  *                    up after 7 s, and the host's next one is tried; a closed port is given up immediately. If a session is
  *                    open, the time of CloseConnection is added
  *   SendIpmiCommand  at most 30 s; a silent controller is given up after 21 s. If the session has to be reopened first, the
- *                    times of CloseConnection and OpenConnection are added
+ *                    times of CloseConnection and OpenConnection are added; after kIpmiClientFail, that of CloseConnection
  *   CloseConnection  at most 1.5 s
  */
 
@@ -28,7 +28,7 @@ extern "C" {
 /* What the functions return. Other libraries may have other numbers; 0 is success with all of them. */
 enum {
   kIpmiClientOk = 0,
-  kIpmiClientWrongPassword = 1,
+  kIpmiClientWrongPassword = 1,   /* with IPMI 1.5 also a controller that is silent when the password is checked */
   kIpmiClientUnknownUser = 2,     /* or one that is disabled */
   kIpmiClientNoAnswer = 3,        /* the controller is silent, or its port is closed; see SendIpmiCommand */
   kIpmiClientHostUnknown = 4,     /* the host name has no address */

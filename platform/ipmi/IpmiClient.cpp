@@ -48,7 +48,6 @@ int SendIpmiCommand(unsigned char command, unsigned char const* request, int req
   if (!Session()) return kIpmiClientNoSession;
 
   ipmi::TReply const reply = Session()->Send(netFn, command, ipmi::TByteVector(request, request + requestLength));
-  if (reply.data.size() > kIpmiClientResponseSize) return kIpmiClientFail;
   *completionCode = reply.completionCode;
   *responseLength = static_cast<unsigned short>(reply.data.size());
   std::copy(reply.data.begin(), reply.data.end(), response);

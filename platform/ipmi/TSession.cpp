@@ -115,7 +115,8 @@ TReply TSession::Send(unsigned char netFn, unsigned char command, TByteVector co
 TReply TSession::AskInSession(unsigned char netFn, unsigned char command, TByteVector const& request,
                               TClock::time_point deadline) {
   TMessage const message = {netFn, fLink->NextSequence(), command, request};
-  TReply const reply = Ask(*fLink, *fEnvelope, message, Lengthened(fTimes.command), deadline);
+  TReply reply = Ask(*fLink, *fEnvelope, message, Lengthened(fTimes.command), deadline);
+  if (reply.data.size() > kIpmiClientResponseSize) throw TFailure{kIpmiClientFail};
   fLastAnswer = TClock::now();
   return reply;
 }

@@ -111,6 +111,35 @@ TEST_F(SessionTest, AControllerThatCalculatesForTwoSecondsIsNotAskedAgainMeanwhi
   EXPECT_EQ(std::count(requests.begin(), requests.end(), "RAKP 1"), 1);
 }
 
+// The times of the library, shortened: an opening takes more answers than these allow.
+TEST_F(SessionTest, AnOpeningEndsWithItsWholeTime) {
+  fRelay.reset();
+  fRelay.emplace(623, kControllersPort,
+                 [](TRelay::TDatagram const& datagram) { return TRelay::TFate{datagram.isAnswer ? 500ms : 0ms}; });
+  ipmi::TTimes times;
+  times.wholeOpening = 1200ms;
+  ipmi::TSession session(Target(), times);
+  auto const start = std::chrono::steady_clock::now();
+  EXPECT_THROW(session.Open(), ipmi::TFailure);
+  auto const taken = std::chrono::steady_clock::now() - start;
+  EXPECT_GE(taken, 1200ms);
+  EXPECT_LT(taken, 10s);  // the steps themselves would wait for longer
+}
+
+TEST_F(SessionTest, ACommandEndsWithItsWholeTime) {
+  ipmi::TTimes times = Patient();
+  times.command = ipmi::TWaits(3, 20s);
+  times.wholeCommand = 1200ms;
+  ipmi::TSession session(Target(), times);
+  session.Open();
+  fSimulator->Stop();
+  auto const start = std::chrono::steady_clock::now();
+  EXPECT_THROW(AddEvent(session), ipmi::TFailure);
+  auto const taken = std::chrono::steady_clock::now() - start;
+  EXPECT_GE(taken, 1200ms);
+  EXPECT_LT(taken, 15s);
+}
+
 TEST_F(SessionTest, AMessageThatIsTooLongForVersion15IsRefusedAndTheSessionGoesOn) {
   fRelay.reset();
   fRelay.emplace(623, kControllersPort, [](TRelay::TDatagram& datagram) {
