@@ -48,8 +48,9 @@ TFinding<std::string> UuidFrom(std::vector<unsigned char> const& u) {
 }
 
 // The first three fields are little-endian since version 2.6 of the standard; before, they have the printed order.
-TFinding<std::string> UuidOf(TSmbiosStructure const& system, std::optional<TSmbiosVersion> version) {
-  bool const isLittleEndian = !version || *version >= TSmbiosVersion(2, 6);
+TFinding<std::string> UuidOf(TSmbiosStructure const& system, TFinding<std::optional<TSmbiosVersion>> const& version) {
+  if (!version) return TMissing{version.Why().fCode, "the byte order is unknown: " + version.Why().fReason};
+  bool const isLittleEndian = !*version || **version >= TSmbiosVersion(2, 6);
   return system.Bytes(0x08, 16).Then([isLittleEndian](std::vector<unsigned char> bytes) {
     if (isLittleEndian) {
       std::reverse(bytes.begin(), bytes.begin() + 4);
@@ -288,7 +289,7 @@ TFinding<std::uint32_t> SpeedOf(TSmbiosStructure const& memoryDevice, std::size_
 }  // namespace
 
 TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name,
-                             std::optional<TSmbiosVersion> version) {
+                             TFinding<std::optional<TSmbiosVersion>> const& version) {
   TRecord record(TCIMSchemaHelper::kSystemCreationClassName, name.fSource);
   record.AddKey("CreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
   record.AddKey("Name", name.fName);

@@ -13,9 +13,10 @@ namespace NQRVZEP20 {
 // SMBIOS structures as records of CIM classes, with the property names, types and numbers of the DMTF. `source`: the source of
 // the values. `number` counts the instances of the class, from 0.
 
-// The version determines the byte order of the UUID; without a version it is the order since version 2.6.
+// The version determines the byte order of the UUID. With an empty version it is the order since version 2.6; when the version is
+// missing because it could not be read, so is the UUID.
 TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name,
-                             std::optional<TSmbiosVersion> version = std::nullopt);
+                             TFinding<std::optional<TSmbiosVersion>> const& version = std::optional<TSmbiosVersion>());
 TRecord BiosRecord(TSmbiosStructure const& bios, std::string const& source, unsigned number);
 TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source, unsigned number);
 TRecord ProcessorRecord(TSmbiosStructure const& processor, std::string const& source, unsigned number, TSystemName const& name);

@@ -2,9 +2,11 @@
 #include "SmbiosVersion.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <filesystem>
 #include <fstream>
 #include <numeric>
+#include <system_error>
 
 namespace NQRVZEP20 {
 
@@ -37,13 +39,16 @@ TSmbiosVersion Corrected(TSmbiosVersion version) {
   return version;
 }
 
-// The start of a file. Empty when the file cannot be read, or is not a regular file: reading a pipe could block.
-std::string StartOf(std::filesystem::path const& path) {
+// The start of a file. Empty when there is no such file, or when it is not a regular one: reading a pipe could block.
+TFinding<std::string> StartOf(std::filesystem::path const& path) {
   std::error_code ignored;
-  if (!std::filesystem::is_regular_file(path, ignored)) return "";
+  if (!std::filesystem::is_regular_file(path, ignored)) return std::string();
+  errno = 0;
   std::ifstream file(path, std::ios::binary);
   std::string start(kLongestEntryPoint, '\0');
   file.read(start.data(), static_cast<std::streamsize>(start.size()));
+  if (!file.is_open() || file.bad())
+    return TMissing{kMissingUnreadable, path.string() + " cannot be read: " + std::generic_category().message(errno)};
   start.resize(static_cast<std::size_t>(file.gcount()));
   return start;
 }
@@ -58,10 +63,10 @@ std::optional<TSmbiosVersion> VersionInEntryPoint(std::string_view bytes) {
   return std::nullopt;
 }
 
-std::optional<TSmbiosVersion> VersionOfTables(std::string const& tableFile) {
-  auto const version = VersionInEntryPoint(StartOf(tableFile));
-  return version ? version
-                 : VersionInEntryPoint(StartOf(std::filesystem::path(tableFile).replace_filename("smbios_entry_point")));
+TFinding<std::optional<TSmbiosVersion>> VersionOfTables(std::string const& tableFile) {
+  auto const inDump = StartOf(tableFile).Then(VersionInEntryPoint);
+  if (!inDump || *inDump) return inDump;
+  return StartOf(std::filesystem::path(tableFile).replace_filename("smbios_entry_point")).Then(VersionInEntryPoint);
 }
 
 }  // namespace NQRVZEP20

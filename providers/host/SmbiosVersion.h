@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "providers/reasons/TFinding.h"
+
 #include <optional>
 #include <string>
 #include <string_view>
@@ -16,7 +18,8 @@ using TSmbiosVersion = std::pair<unsigned, unsigned>;
 std::optional<TSmbiosVersion> VersionInEntryPoint(std::string_view bytes);
 
 // The version of the tables in a file, from the entry point with which a dump begins; for a bare table, from the file
-// smbios_entry_point in the same directory, where the kernel has it. None when neither contains an entry point.
-std::optional<TSmbiosVersion> VersionOfTables(std::string const& tableFile);
+// smbios_entry_point in the same directory, where the kernel has it. An empty value when neither contains an entry point; missing
+// when one of the files exists but cannot be read.
+TFinding<std::optional<TSmbiosVersion>> VersionOfTables(std::string const& tableFile);
 
 }  // namespace NQRVZEP20

@@ -145,7 +145,7 @@ std::vector<TSmbiosStructure> TSmbiosReader::All(int type) const {
   return structures;
 }
 
-std::optional<TSmbiosVersion> TSmbiosReader::Version() const {
+TFinding<std::optional<TSmbiosVersion>> TSmbiosReader::Version() const {
   return VersionOfTables(fTableFile.empty() ? kKernelTable : fTableFile);
 }
 

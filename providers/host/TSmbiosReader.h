@@ -25,8 +25,8 @@ public:
   // Every structure of that type, in the order of the table. With a library that cannot go on after the first: the first.
   std::vector<TSmbiosStructure> All(int type) const;
 
-  // The version of the standard that the tables follow; none when no entry point tells it.
-  std::optional<TSmbiosVersion> Version() const;
+  // The version of the standard that the tables follow, as VersionOfTables has it.
+  TFinding<std::optional<TSmbiosVersion>> Version() const;
 
   // What the values of such a structure come from: "SMBIOS type 17", or "SMBIOS type 17 (file)".
   std::string SourceOf(int type) const;

@@ -90,16 +90,17 @@ TEST(SystemRecordTest, PlaceholdersAndMissingFieldsAreNullWithAReason) {
 
 TEST(SystemRecordTest, TheVersionDecidesTheByteOrderOfTheUuid) {
   TStructureMaker const maker = System().Bytes(0x08, "\x33\x22\x11\x00\x55\x44\x77\x66\x88\x99\xaa\xbb\xcc\xdd\xee\xff"s);
-  auto const uuid = [&](std::optional<TSmbiosVersion> version) {
+  auto const uuid = [&](TFinding<std::optional<TSmbiosVersion>> const& version) {
     return PropertyOf(ComputerSystemRecord(maker.Make(), "SMBIOS type 1", TSystemName{"db1", "uname"}, version), "UUID");
   };
   std::string const asItStands = "string 33221100-5544-7766-8899-AABBCCDDEEFF";
   std::string const turned = "string 00112233-4455-6677-8899-AABBCCDDEEFF";
   for (TSmbiosVersion const& version : {TSmbiosVersion(2, 0), TSmbiosVersion(2, 3), TSmbiosVersion(2, 5)})
-    EXPECT_EQ(uuid(version), asItStands) << version.second;
+    EXPECT_EQ(uuid(std::optional(version)), asItStands) << version.second;
   for (TSmbiosVersion const& version : {TSmbiosVersion(2, 6), TSmbiosVersion(2, 8), TSmbiosVersion(3, 0)})
-    EXPECT_EQ(uuid(version), turned) << version.second;
-  EXPECT_EQ(uuid(std::nullopt), turned) << "unknown";
+    EXPECT_EQ(uuid(std::optional(version)), turned) << version.second;
+  EXPECT_EQ(uuid(std::optional<TSmbiosVersion>()), turned) << "no entry point";
+  EXPECT_EQ(uuid(TMissing{kMissingUnreadable, "f cannot be read"}), "string NULL unreadable: the byte order is unknown: f cannot be read");
 }
 
 TEST(SystemRecordTest, AUuidThatIsNotSetIsNull) {

@@ -4,7 +4,9 @@
 #include "tests/SmbiosTables.h"
 
 #include <gtest/gtest.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 namespace NQRVZEP20 {
 namespace {
@@ -60,7 +62,7 @@ class VersionOfTablesTest : public testing::Test {
 protected:
   std::string VersionOf(std::string const& table) {
     WriteFile(fDir.Path("DMI"), table);
-    return VersionText(VersionOfTables(fDir.Path("DMI")));
+    return VersionText(*VersionOfTables(fDir.Path("DMI")));
   }
   TTempDir fDir;
 };
@@ -80,6 +82,26 @@ TEST_F(VersionOfTablesTest, TheEntryPointOfABareTableIsInItsDirectory) {
   EXPECT_EQ(VersionOf(RealTable("full")), "none");
 }
 
+TEST_F(VersionOfTablesTest, AFileThatCannotBeReadIsTheReason) {
+  WriteFile(fDir.Path("DMI"), RealTable("full"));
+  WriteFile(fDir.Path("smbios_entry_point"), EntryPoint32(100, 32, 0x1F, 0x204));
+  int const probe = ::dup(STDIN_FILENO);
+  ::close(probe);
+  rlimit before{};
+  ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &before), 0);
+  rlimit const none{static_cast<rlim_t>(probe), before.rlim_max};  // no further descriptor
+  ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &none), 0);
+  auto const version = VersionOfTables(fDir.Path("DMI"));
+  ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &before), 0);
+  ASSERT_FALSE(version);
+  EXPECT_EQ(version.Why().fReason, fDir.Path("DMI") + " cannot be read: Too many open files");
+
+  std::filesystem::remove(fDir.Path("smbios_entry_point"));
+  std::filesystem::create_symlink("/proc/self/mem", fDir.Path("smbios_entry_point"));  // a regular file that cannot be read at 0
+  EXPECT_EQ(VersionOfTables(fDir.Path("DMI")).Why().fReason,
+            fDir.Path("smbios_entry_point") + " cannot be read: Input/output error");
+}
+
 TEST_F(VersionOfTablesTest, APipeDoesNotBlock) {
   ASSERT_EQ(::mkfifo(fDir.Path("smbios_entry_point").c_str(), 0600), 0);
   EXPECT_EQ(VersionOf(RealTable("full")), "none");
@@ -87,8 +109,8 @@ TEST_F(VersionOfTablesTest, APipeDoesNotBlock) {
 
 TEST_F(VersionOfTablesTest, TheRealTablesHaveTheVersionsOfTheirMachines) {
   for (std::string const& name : kRealTables)
-    EXPECT_EQ(VersionText(VersionOfTables(RealTablePath(name))), name == "entry64" ? "3.0" : "2.8") << name;
-  EXPECT_EQ(VersionText(VersionOfTables(SamplePath())), "3.3");
+    EXPECT_EQ(VersionText(*VersionOfTables(RealTablePath(name))), name == "entry64" ? "3.0" : "2.8") << name;
+  EXPECT_EQ(VersionText(*VersionOfTables(SamplePath())), "3.3");
 }
 
 }  // namespace
