@@ -100,7 +100,8 @@ TEST(SystemRecordTest, TheVersionDecidesTheByteOrderOfTheUuid) {
   for (TSmbiosVersion const& version : {TSmbiosVersion(2, 6), TSmbiosVersion(2, 8), TSmbiosVersion(3, 0)})
     EXPECT_EQ(uuid(std::optional(version)), turned) << version.second;
   EXPECT_EQ(uuid(std::optional<TSmbiosVersion>()), turned) << "no entry point";
-  EXPECT_EQ(uuid(TMissing{kMissingUnreadable, "f cannot be read"}), "string NULL unreadable: the byte order is unknown: f cannot be read");
+  EXPECT_EQ(uuid(TMissing{kMissingUnreadable, "f cannot be read"}),
+            "string NULL unreadable: the byte order is unknown: f cannot be read");
 }
 
 TEST(SystemRecordTest, AUuidThatIsNotSetIsNull) {
