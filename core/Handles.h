@@ -5,6 +5,7 @@
 #include <dlfcn.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <cstdio>
 #include <memory>
 #include <string>
@@ -42,6 +43,7 @@ inline std::string LinkerReason() {
   return reason ? reason : "";
 }
 
+// A file descriptor; below 0 there is none. Closing keeps errno, so that the reason of a failure outlives the descriptor.
 class TUniqueFd {
 public:
   explicit TUniqueFd(int fd = -1) noexcept : fFd(fd) {}
@@ -56,7 +58,9 @@ public:
   explicit operator bool() const noexcept { return fFd >= 0; }
   int release() noexcept { return std::exchange(fFd, -1); }
   void reset(int fd = -1) noexcept {
+    int const error = errno;
     if (fFd >= 0) ::close(fFd);
+    errno = error;
     fFd = fd;
   }
 

@@ -56,6 +56,9 @@ bool IsCompleted(char const* packet, std::ptrdiff_t lengthPlace) {
   return place >= 0 && packet[place] == 0;
 }
 
+// The code of a failure in the log: that of the library, or a status of ours when it could not be called.
+int LoggedCodeOf(TIpmiResult const& result) { return result.fLoad ? result.fCode : static_cast<int>(StatusOf(result.fLoad)); }
+
 }  // namespace
 
 IIPMILan* IIPMILan::Initialize() {
@@ -94,13 +97,13 @@ bool IIPMILan::IpmilanOpenConnect(std::string host, std::string user, std::strin
   LogDebug("host: ", host);
   LogDebug("username: ", user);
   LogDebug("password: ", password);  // in clear text. Kept.
-  int const result = OpenIpmiConnection(host, user, password);
+  TIpmiResult const result = OpenIpmiConnection(host, user, password);
   gIPMILanHost = host;
   gIPMILanPort = kIpmiPort;
   gIPMILanUser = user;
   gIPMILanPass = password;
-  if (result != 0) {
-    LogDebug("Connection Error code:", result);
+  if (!result) {
+    LogDebug("Connection Error code:", LoggedCodeOf(result));
     LogDebug("Open IPMI Lan Connection failed. \n");
     return false;
   }

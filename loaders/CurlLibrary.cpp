@@ -4,6 +4,8 @@
 #include "TOSSpecific.h"
 #include "core/Failure.h"
 
+#include <string_view>
+
 namespace NQRVZEP20 {
 namespace {
 
@@ -13,45 +15,34 @@ namespace {
   LogErrorAndThrow(kZEPStatusLibCurlFailure, message.substr(0, reason), std::string(message.substr(reason)) + detail);
 }
 
-// Ends the search at the first function that is missing, of which the linker tells.
-template <class TFunction>
-TFunction* FunctionOrThrow(void* library, char const* name, char const* message) {
-  TFunction* const function = FunctionOf<TFunction>(library, name);
-  if (function == nullptr) Throw(message, LinkerReason());
-  return function;
-}
-
 }  // namespace
 
+TLibraryPlace TCurlFunctions::Place() {
+  std::string const root = TOSSpecific::GetZEPRootPath();
+  return {{root + "/libcurl.so", root + "/libcurl.so.4", "libcurl.so", "libcurl.so.4", "libcurl.so.3", "libcurl.so.2"},
+          RTLD_LAZY};
+}
+
+std::vector<TLibraryFunction> TCurlFunctions::Table() {
+  return {{"curl_global_init", fGlobalInit}, {"curl_easy_init", fInit},       {"curl_easy_setopt", fSetOption},
+          {"curl_easy_perform", fPerform},   {"curl_easy_cleanup", fCleanup}, {"curl_global_cleanup", fGlobalCleanup}};
+}
+
 TCurl::TCurl(TCurlMessages const& messages)
-    : fLibrary(Open(messages.fNotOpened)),
-      fFunctions(FunctionsOf(fLibrary.get(), messages.fFunctionMissing)),
-      fGlobalState(fFunctions),
-      fHandle(fFunctions.init(), fFunctions.cleanup) {
+    : fGlobalState(Checked(fLibrary, messages)), fHandle(fLibrary->fInit(), fLibrary->fCleanup) {
   if (!fHandle) Fail(messages.fNotInitialised);
   Set(CURLOPT_ERRORBUFFER, fErrorText, messages.fErrorBuffer);
 }
 
-TSharedLibrary TCurl::Open(char const* message) {
-  std::string const root = TOSSpecific::GetZEPRootPath();
-  for (std::string const& name : {root + "/libcurl.so", root + "/libcurl.so.4", std::string("libcurl.so"),
-                                  std::string("libcurl.so.4"), std::string("libcurl.so.3"), std::string("libcurl.so.2")})
-    if (TSharedLibrary library{::dlopen(name.c_str(), RTLD_LAZY)}) return library;
-  Throw(message, LinkerReason());
+TCurlFunctions const& TCurl::Checked(TLoadedLibrary<TCurlFunctions> const& library, TCurlMessages const& messages) {
+  TLoadOutcome const& outcome = library.Outcome();
+  if (outcome) return *library;
+  Throw(outcome.fKind == TLoadOutcome::kNotLoaded ? messages.fNotOpened : messages.fFunctionMissing, outcome.fReason);
 }
 
-TCurl::TFunctions TCurl::FunctionsOf(void* library, char const* message) {
-  return {FunctionOrThrow<decltype(curl_global_init)>(library, "curl_global_init", message),
-          FunctionOrThrow<decltype(curl_easy_init)>(library, "curl_easy_init", message),
-          FunctionOrThrow<decltype(curl_easy_setopt)>(library, "curl_easy_setopt", message),
-          FunctionOrThrow<decltype(curl_easy_perform)>(library, "curl_easy_perform", message),
-          FunctionOrThrow<decltype(curl_easy_cleanup)>(library, "curl_easy_cleanup", message),
-          FunctionOrThrow<decltype(curl_global_cleanup)>(library, "curl_global_cleanup", message)};
-}
-
-// Its result is not asked for: without it no handle is to be had either.
-TCurl::TGlobalState::TGlobalState(TFunctions const& functions) : fCleanup(functions.globalCleanup) {
-  functions.globalInit(CURL_GLOBAL_ALL);
+// The result of the initialisation is not checked: after a failure no handle can be had either.
+TCurl::TGlobalState::TGlobalState(TCurlFunctions const& functions) : fCleanup(functions.fGlobalCleanup) {
+  functions.fGlobalInit(CURL_GLOBAL_ALL);
 }
 
 void TCurl::Fail(char const* message) { Throw(message, ""); }

@@ -1,13 +1,32 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "core/Handles.h"
+#include "loaders/TLoadedLibrary.h"
 
+// Transfers are limited to one protocol by options that every libcurl has; newer ones prefer others.
+#define CURL_DISABLE_DEPRECATION
 #include <curl/curl.h>
+
+#include <memory>
+#include <vector>
 
 namespace NQRVZEP20 {
 
-// What is logged when libcurl cannot be had, each message as a whole; behind the first two stands the loader's reason.
+// The functions of libcurl that every transfer uses. It is loaded, never linked: the first libcurl that can be had, in the
+// directory of the core library or by the linker's search.
+struct TCurlFunctions {
+  decltype(curl_global_init)* fGlobalInit = nullptr;
+  decltype(curl_easy_init)* fInit = nullptr;
+  decltype(curl_easy_setopt)* fSetOption = nullptr;
+  decltype(curl_easy_perform)* fPerform = nullptr;
+  decltype(curl_easy_cleanup)* fCleanup = nullptr;
+  decltype(curl_global_cleanup)* fGlobalCleanup = nullptr;
+
+  static TLibraryPlace Place();
+  std::vector<TLibraryFunction> Table();
+};
+
+// Messages logged when libcurl cannot be used. The linker's reason is appended to the first two.
 struct TCurlMessages {
   char const* fNotOpened;
   char const* fFunctionMissing;
@@ -15,48 +34,38 @@ struct TCurlMessages {
   char const* fErrorBuffer;
 };
 
-// One transfer by libcurl, which is loaded for it (and never linked), and unloaded with it: the handle is cleaned up, then
-// libcurl itself, then the library is closed. Of libcurl's global state there is one per process: no two of these at once.
+// One transfer by libcurl, which is loaded for it and unloaded with it: the handle is cleaned up, then libcurl itself, then
+// the library is closed. Of libcurl's global state there is one per process: no two of these at once.
 class TCurl {
 public:
-  // Loads the first libcurl that can be had, beside the core library or by the loader's search, and sets the error buffer.
-  // A failure is logged as an error and throws kZEPStatusLibCurlFailure.
+  // Loads libcurl and sets the error buffer. A failure is logged as an error and throws TZEPFailure with
+  // kZEPStatusLibCurlFailure.
   explicit TCurl(TCurlMessages const& messages);
 
-  // Numbers are to be `long`, texts are copied by libcurl. A failure is logged as an error with that message and throws
-  // kZEPStatusLibCurlFailure.
+  // Numbers must be `long`; texts are copied by libcurl. A failure is logged as an error with that message and throws
+  // TZEPFailure with kZEPStatusLibCurlFailure.
   template <class TValue>
   void Set(CURLoption option, TValue value, char const* message) {
-    if (fFunctions.setOption(fHandle.get(), option, value) != CURLE_OK) Fail(message);
+    if (fLibrary->fSetOption(fHandle.get(), option, value) != CURLE_OK) Fail(message);
   }
 
-  CURLcode Perform() { return fFunctions.perform(fHandle.get()); }
+  CURLcode Perform() { return fLibrary->fPerform(fHandle.get()); }
 
-  // What libcurl said of a failing Perform; may be empty.
+  // libcurl's text for a Perform that failed; may be empty.
   char const* ErrorText() const { return fErrorText; }
 
 private:
-  struct TFunctions {
-    decltype(curl_global_init)* globalInit;
-    decltype(curl_easy_init)* init;
-    decltype(curl_easy_setopt)* setOption;
-    decltype(curl_easy_perform)* perform;
-    decltype(curl_easy_cleanup)* cleanup;
-    decltype(curl_global_cleanup)* globalCleanup;
-  };
   struct TGlobalState {
-    explicit TGlobalState(TFunctions const& functions);
+    explicit TGlobalState(TCurlFunctions const& functions);
     ~TGlobalState() { fCleanup(); }
     decltype(curl_global_cleanup)* fCleanup;
   };
 
-  static TSharedLibrary Open(char const* message);
-  static TFunctions FunctionsOf(void* library, char const* message);
+  static TCurlFunctions const& Checked(TLoadedLibrary<TCurlFunctions> const& library, TCurlMessages const& messages);
   [[noreturn]] static void Fail(char const* message);
 
-  // In the order in which they are made; they are released the other way round.
-  TSharedLibrary const fLibrary;
-  TFunctions const fFunctions;
+  // In the order in which they are made; they are released in the opposite order.
+  TLoadedLibrary<TCurlFunctions> const fLibrary;
   TGlobalState const fGlobalState;
   char fErrorText[CURL_ERROR_SIZE] = "";  // libcurl does not always fill it
   std::unique_ptr<CURL, decltype(curl_easy_cleanup)*> const fHandle;

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "loaders/TLoadedLibrary.h"
 #include "platform/include/ipmiClient.h"
 
 #include <array>
@@ -10,16 +11,21 @@
 namespace NQRVZEP20 {
 
 // The platform library libipmiClient.so, for the rooms that talk to a management controller. It is loaded by its plain name
-// on first use and then stays loaded; as long as loading fails, each call tries again. Exceptions thrown by the library pass
-// through.
-//
-// Each function returns the library's result, 0 for success; kZEPStatusFileSystemError when the library cannot be loaded,
-// and kZEPStatusNotFound when it lacks the function.
+// on first use and then stays loaded; as long as loading fails, each call tries again. A function that it lacks is missed when
+// it is called; the others can still be used. Exceptions thrown by the library pass through.
+
+// How a call of the library ended.
+struct TIpmiResult {
+  TLoadOutcome fLoad;  // whether the function could be called
+  int fCode = 0;       // returned by the function, if it was called; kIpmiClientOk or an error of the library
+
+  explicit operator bool() const { return fLoad && fCode == kIpmiClientOk; }
+};
 
 constexpr char const* kIpmiPort = "623";
 
 // Opens a session over the LAN, on port kIpmiPort.
-int OpenIpmiConnection(std::string const& host, std::string const& user, std::string const& password);
+TIpmiResult OpenIpmiConnection(std::string const& host, std::string const& user, std::string const& password);
 
 struct TIpmiCommand {
   unsigned char netFn, command;
@@ -29,8 +35,8 @@ struct TIpmiCommand {
 // The response as the library wrote it. Bytes that it did not write are 0; the last byte is always 0.
 using TIpmiResponse = std::array<unsigned char, kIpmiClientResponseSize + 1>;
 
-int SendIpmiCommand(TIpmiCommand const& command, TIpmiResponse& response);
+TIpmiResult SendIpmiCommand(TIpmiCommand const& command, TIpmiResponse& response);
 
-int CloseIpmiConnection();
+TIpmiResult CloseIpmiConnection();
 
 }  // namespace NQRVZEP20

@@ -1,55 +1,54 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "loaders/SmbiosLibrary.h"
 
-#include "TZEPException.h"
-#include "core/Handles.h"
+#include "loaders/TKeptLibrary.h"
 
 #include <algorithm>
+#include <cerrno>
 
 namespace NQRVZEP20 {
 namespace {
 
-struct TSmbiosFunctions {
-  decltype(&smBiosLoad) load;
-  decltype(&smBiosGetFirst) getFirst;
-  decltype(&smBiosClose) close;
-};
+using TSmbiosLibrary = TLoadedLibrary<TSmbiosFunctions>;
 
-TSmbiosFunctions LoadFunctions() {
-  TSharedLibrary library(::dlopen("libsmbios.so", RTLD_NOW));
-  if (!library) throw TZEPException(kZEPStatusFileSystemError);
-  TSmbiosFunctions const functions = {FunctionOf<decltype(smBiosLoad)>(library.get(), "smBiosLoad"),
-                                      FunctionOf<decltype(smBiosGetFirst)>(library.get(), "smBiosGetFirst"),
-                                      FunctionOf<decltype(smBiosClose)>(library.get(), "smBiosClose")};
-  if (!functions.load || !functions.getFirst || !functions.close) throw TZEPException(kZEPStatusNotFound);
-  library.release();  // stays loaded
-  return functions;
-}
-
-// When LoadFunctions throws, the next call tries again.
-TSmbiosFunctions const& Functions() {
-  static TSmbiosFunctions const functions = LoadFunctions();
-  return functions;
+std::shared_ptr<TSmbiosLibrary const> LibraryFor(TSmbiosTables::ELibraryLife life) {
+  if (life == TSmbiosTables::kStaysLoaded) return TKeptLibrary<TSmbiosFunctions>::Get();
+  return std::make_shared<TSmbiosLibrary const>();
 }
 
 }  // namespace
 
-TSmbiosTables::TSmbiosTables() {
-  try {
-    TSmbiosFunctions const& functions = Functions();
-    void* handle = nullptr;
-    fOpenStatus = functions.load(nullptr, &handle);
-    if (fOpenStatus == kZEPStatusOK) fHandle = {handle, functions.close};
-  } catch (TZEPException const& failed) {
-    fOpenStatus = failed.GetStatusCode().GetCode();
-  }
+std::vector<TLibraryFunction> TSmbiosFunctions::Table() {
+  return {{"smBiosLoad", fLoad},
+          {"smBiosGetFirst", fGetFirst},
+          {"smBiosGetNext", fGetNext, TLibraryFunction::kOptional},
+          {"smBiosClose", fClose}};
 }
 
-int TSmbiosTables::GetFirst(int type, char* buffer, int size, int& length) {
+TSmbiosTables::TSmbiosTables(ELibraryLife life) : fLibrary(LibraryFor(life)) {
+  if (!Library()) return;
+  TSmbiosFunctions const& functions = **fLibrary;
+  void* handle = nullptr;
+  errno = 0;
+  fOpenStatus = functions.fLoad(nullptr, &handle);
+  fOpenError = errno;
+  if (fOpenStatus == kSmbiosOk) fHandle = {handle, functions.fClose};
+}
+
+int TSmbiosTables::GetFirst(int type, void* buffer, int size, int& length) {
+  return Get((*fLibrary)->fGetFirst, type, buffer, size, length);
+}
+
+int TSmbiosTables::GetNext(int type, void* buffer, int size, int& length) {
+  return Get((*fLibrary)->fGetNext, type, buffer, size, length);
+}
+
+int TSmbiosTables::Get(decltype(smBiosGetFirst)* get, int type, void* buffer, int size, int& length) {
   length = 0;
-  if (!HasHandle()) return kZEPStatusFail;
+  if (!HasHandle()) return kSmbiosFail;
+  if (get == nullptr) return kSmbiosNoMoreItems;
   int structureLength = size;
-  int const status = Functions().getFirst(fHandle.get(), type, buffer, &structureLength);
+  int const status = get(fHandle.get(), type, buffer, &structureLength);
   length = std::clamp(structureLength, 0, size);
   return status;
 }

@@ -1,36 +1,64 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "loaders/TLoadedLibrary.h"
 #include "platform/include/smbios.h"
 
 #include <memory>
+#include <vector>
 
 namespace NQRVZEP20 {
 
-// The SMBIOS tables of this machine, open through the platform library libsmbios.so for as long as the object lives.
-//
-// The library is loaded by its plain name when first needed and then stays loaded; while it cannot be had, each new object
-// tries again.
+// The functions of the platform library libsmbios.so, which is loaded by its plain name.
+struct TSmbiosFunctions {
+  decltype(smBiosLoad)* fLoad = nullptr;
+  decltype(smBiosGetFirst)* fGetFirst = nullptr;
+  decltype(smBiosGetNext)* fGetNext = nullptr;  // null in a library that lacks it
+  decltype(smBiosClose)* fClose = nullptr;
+
+  static TLibraryPlace Place() { return {{"libsmbios.so"}, RTLD_NOW}; }
+  std::vector<TLibraryFunction> Table();
+};
+
+// The SMBIOS tables, open through libsmbios.so for as long as the object lives.
 class TSmbiosTables {
 public:
-  TSmbiosTables();  // opens them; throws nothing
+  enum ELibraryLife {
+    kStaysLoaded,      // the library is loaded when first needed and then stays; while it fails to load, each object tries again
+    kClosedWithTables  // each object loads the library anew
+  };
 
-  // What the library said of opening; kZEPStatusFileSystemError when it could not be loaded, kZEPStatusNotFound when it
-  // lacks one of its functions.
+  // Opens the tables; throws nothing.
+  explicit TSmbiosTables(ELibraryLife life);
+
+  // How loading the library ended.
+  TLoadOutcome const& Library() const { return fLibrary->Outcome(); }
+
+  // Returned by the library on opening; of no meaning when it could not be loaded.
   int OpenStatus() const { return fOpenStatus; }
 
-  // A library may say that all went well and hand out nothing.
+  // The errno that the library left on opening; 0 when it left none.
+  int OpenError() const { return fOpenError; }
+
+  // A library may report success and hand out nothing.
   bool HasHandle() const { return fHandle != nullptr; }
 
   // Copies the first structure of that type into the buffer of `size` bytes, which the caller has cleared, and returns
-  // the library's status; kZEPStatusFail without a handle. `length` lies within 0 to `size`, whatever the library says.
-  int GetFirst(int type, char* buffer, int size, int& length);
+  // the library's status; kSmbiosFail without a handle. `length` lies within 0 to `size`, whatever the library reports.
+  int GetFirst(int type, void* buffer, int size, int& length);
+
+  // The same for the next structure of that type. kSmbiosNoMoreItems with a library that lacks smBiosGetNext.
+  int GetNext(int type, void* buffer, int size, int& length);
 
   void Close() { fHandle.reset(); }
 
 private:
-  int fOpenStatus = 0;
-  std::unique_ptr<void, decltype(&smBiosClose)> fHandle{nullptr, nullptr};
+  int Get(decltype(smBiosGetFirst)* get, int type, void* buffer, int size, int& length);
+
+  std::shared_ptr<TLoadedLibrary<TSmbiosFunctions> const> const fLibrary;
+  int fOpenStatus = kSmbiosFail;
+  int fOpenError = 0;
+  std::unique_ptr<void, decltype(smBiosClose)*> fHandle{nullptr, nullptr};
 };
 
 }  // namespace NQRVZEP20

@@ -1,25 +1,35 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "loaders/UsbLan.h"
 
-#include "core/Handles.h"
 #include "core/Log.h"
+#include "loaders/TLoadedLibrary.h"
 #include "platform/include/usblan.h"
 
 namespace NQRVZEP20 {
+namespace {
+
+struct TUsbLanFunctions {
+  decltype(GetNodes)* fGetNodes = nullptr;
+  decltype(BringupOvdLan)* fBringUp = nullptr;
+  decltype(QueryOvdLanState)* fQueryState = nullptr;
+
+  static TLibraryPlace Place() { return {{"./ovdusblan.so"}, RTLD_LAZY}; }
+  std::vector<TLibraryFunction> Table() {
+    return {{"GetNodes", fGetNodes}, {"BringupOvdLan", fBringUp}, {"QueryOvdLanState", fQueryState}};
+  }
+};
+
+}  // namespace
 
 bool BringUpUsbLan() {
-  TSharedLibrary const library(::dlopen("./ovdusblan.so", RTLD_LAZY));
-  if (!library) return false;
-  auto* const getNodes = FunctionOf<decltype(GetNodes)>(library.get(), "GetNodes");
-  auto* const bringUp = FunctionOf<decltype(BringupOvdLan)>(library.get(), "BringupOvdLan");
-  auto* const queryState = FunctionOf<decltype(QueryOvdLanState)>(library.get(), "QueryOvdLanState");
-  if (!getNodes || !bringUp || !queryState) return false;
+  TLoadedLibrary<TUsbLanFunctions> const usbLan;
+  if (!usbLan.Outcome()) return false;
 
   constexpr int kIsUp = 1;
   try {
-    int const nodes = getNodes();
+    int const nodes = usbLan->fGetNodes();
     for (int node = 0; node < nodes; ++node)
-      if (queryState(node) != kIsUp) bringUp(node);
+      if (usbLan->fQueryState(node) != kIsUp) usbLan->fBringUp(node);
     return true;
   } catch (...) {
     LogDebug("USB over Lan Bring up fail. \n");

@@ -47,9 +47,14 @@ void LogIdentity(std::string const& productDescription, TMachineIdentity const& 
   LogDebug(identity.model);
 }
 
+// The status that is logged when the tables cannot be opened.
+int OpenStatusOf(TSmbiosTables const& tables) {
+  return tables.Library() ? tables.OpenStatus() : static_cast<int>(StatusOf(tables.Library()));
+}
+
 bool AreOpen(TSmbiosTables const& tables) {
-  if (tables.OpenStatus() != kZEPStatusOK) {
-    LogDebug("getMachineType: Unable to open SMBIOS lib error = ", tables.OpenStatus());
+  if (int const status = OpenStatusOf(tables); status != kZEPStatusOK) {
+    LogDebug("getMachineType: Unable to open SMBIOS lib error = ", status);
     return false;
   }
   if (!tables.HasHandle()) {
@@ -96,7 +101,7 @@ TMachineIdentity IdentityIn(std::string_view systemInformation, EIdentityLog log
 
 // Reads SMBIOS type 1, for GetMachineType and GetMachineInfo alike: the messages of both name the former.
 TMachineIdentity ReadMachineIdentity(EIdentityLog logged) {
-  TSmbiosTables tables;
+  TSmbiosTables tables(TSmbiosTables::kStaysLoaded);
   if (!AreOpen(tables)) return {};
   TStructure const structure = ReadSystemInformation(tables);
   if (!structure.fBuffer) return {};
@@ -139,12 +144,12 @@ std::string BiosVersionIn(char* buffer) {
 class TBiosVersionReader {
 public:
   explicit TBiosVersionReader(TBiosVersionMessages const& messages) : fMessages(messages) {
-    if (fBuffer) fTables.emplace();  // without memory they are not opened
+    if (fBuffer) fTables.emplace(TSmbiosTables::kStaysLoaded);  // without memory they are not opened
   }
 
   // The cleaned version, empty when the read failed. Nothing when the tables cannot be opened or hold no such structure.
   std::optional<std::string> Read() {
-    int const openStatus = fTables ? fTables->OpenStatus() : kZEPStatusOutOfMemory;
+    int const openStatus = fTables ? OpenStatusOf(*fTables) : static_cast<int>(kZEPStatusOutOfMemory);
     if (openStatus != kZEPStatusOK) {
       LogDebug(fMessages.unableToOpen, openStatus);
       return std::nullopt;
@@ -192,8 +197,8 @@ std::optional<TIpmiResponse> ReadFruData(unsigned offset) {
   auto const low = static_cast<unsigned char>(offset & 0xFF);
   auto const high = static_cast<unsigned char>(offset >> 8);
   TIpmiResponse response;
-  int const result = SendIpmiCommand({kStorage, kReadFruData, {kFruDevice, low, high, kBytesAsked}}, response);
-  return result == 0 ? std::optional(response) : std::nullopt;
+  TIpmiResult const result = SendIpmiCommand({kStorage, kReadFruData, {kFruDevice, low, high, kBytesAsked}}, response);
+  return result ? std::optional(response) : std::nullopt;
 }
 
 // The response as text: byte 0 is the count, the data follow.
@@ -211,7 +216,7 @@ struct TAccess {
 // Reads from `offset` of the FRU data of a controller what `fieldOf` takes out of the response.
 template <class TField>
 std::string ReadRemote(std::string_view operation, TAccess const& access, unsigned offset, TField fieldOf) {
-  if (OpenIpmiConnection(access.host, access.user, access.password) != 0) return "";
+  if (!OpenIpmiConnection(access.host, access.user, access.password)) return "";
   std::optional<TIpmiResponse> const response = ReadFruData(offset);
   if (!response) return "N/A";
   LogDebug("SendIpmiCommand successfully. \nrspBuffer for ", operation, ":");

@@ -73,13 +73,11 @@ std::vector<TAddress> AddressesOf(std::string const& host, std::string const& po
 
 TLink::TLink(TAddress const& address) : fAddress(address), fSocket(UnconnectedSocket(address.address.ss_family)) {}
 
-TLink::~TLink() { ::close(fSocket); }
-
 void TLink::Send(TPacket const& packet) {
   // A refusal of an earlier packet is reported by the next call, which then does nothing else: hence the second one.
   for (int attempt = 0; attempt < 2; ++attempt) {
     auto const address = reinterpret_cast<sockaddr const*>(&fAddress.address);
-    if (::sendto(fSocket, packet.data(), packet.size(), MSG_NOSIGNAL, address, fAddress.size) >= 0) return;
+    if (::sendto(fSocket.get(), packet.data(), packet.size(), MSG_NOSIGNAL, address, fAddress.size) >= 0) return;
     if (errno == ECONNREFUSED) fIsRefused = true;
   }
   bool const isLost = errno == ECONNREFUSED || errno == ENOBUFS || errno == EAGAIN || errno == EINTR;
@@ -89,10 +87,10 @@ void TLink::Send(TPacket const& packet) {
 std::optional<TPacket> TLink::Receive(TClock::time_point until) {
   TPacket packet(kLongestPacket);
   while (TClock::now() < until && !NobodyListens()) {
-    pollfd waiting = {fSocket, POLLIN, 0};
+    pollfd waiting = {fSocket.get(), POLLIN, 0};
     if (::poll(&waiting, 1, MillisecondsUntil(until)) <= 0) continue;
     if ((waiting.revents & POLLERR) != 0) TakeErrors();
-    ssize_t const size = ::recv(fSocket, packet.data(), packet.size(), MSG_TRUNC);
+    ssize_t const size = ::recv(fSocket.get(), packet.data(), packet.size(), MSG_TRUNC);
     if (size < 0) continue;
     fHasReceived = true;
     bool const isWhole = static_cast<std::size_t>(size) <= packet.size();
@@ -105,10 +103,10 @@ std::optional<TPacket> TLink::Receive(TClock::time_point until) {
 void TLink::TakeErrors() {
   int error = 0;
   socklen_t size = sizeof error;
-  if (::getsockopt(fSocket, SOL_SOCKET, SO_ERROR, &error, &size) == 0 && error == ECONNREFUSED) fIsRefused = true;
+  if (::getsockopt(fSocket.get(), SOL_SOCKET, SO_ERROR, &error, &size) == 0 && error == ECONNREFUSED) fIsRefused = true;
   // What was said waits in a queue of its own, the packet that it was said of with it.
   char packet[kLongestPacket];
-  while (::recv(fSocket, packet, sizeof packet, MSG_ERRQUEUE) >= 0) {
+  while (::recv(fSocket.get(), packet, sizeof packet, MSG_ERRQUEUE) >= 0) {
   }
 }
 

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "core/Handles.h"
+
 #include <netinet/in.h>
 #include <sys/socket.h>
 
@@ -30,9 +32,6 @@ class TLink {
 public:
   // Throws TFailure{kIpmiClientUnreachable} when the system has no such addresses.
   explicit TLink(TAddress const& address);
-  ~TLink();
-  TLink(TLink const&) = delete;
-  TLink& operator=(TLink const&) = delete;
 
   // A packet that the network loses on the way is no failure. Throws TFailure{kIpmiClientUnreachable} when the system cannot
   // send there.
@@ -52,7 +51,7 @@ private:
   void TakeErrors();
 
   TAddress const fAddress;
-  int const fSocket;
+  NQRVZEP20::TUniqueFd const fSocket;
   bool fIsRefused = false;
   bool fHasReceived = false;
   unsigned char fSequence = 0;

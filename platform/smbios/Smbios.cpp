@@ -4,6 +4,8 @@
 
 #include "platform/include/smbios.h"
 
+#include "core/Handles.h"
+#include "core/TNeverDestroyed.h"
 #include "platform/smbios/SmbiosTable.h"
 
 #include <errno.h>
@@ -37,22 +39,6 @@ using TSharedTableFile = std::shared_ptr<TTableFile const>;
 struct THandle {
   TSharedTableFile file;
   smbios::TStructureReader place;
-};
-
-class TOpenFile {
-public:
-  // Opening does not wait, whatever the path names.
-  explicit TOpenFile(char const* path) : fFd(::open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK)) {}
-  ~TOpenFile() {
-    if (fFd >= 0) ::close(fFd);
-  }
-  TOpenFile(TOpenFile const&) = delete;
-  TOpenFile& operator=(TOpenFile const&) = delete;
-
-  int Fd() const { return fFd; }
-
-private:
-  int fFd;  // -1: not opened
 };
 
 char const* TablePath() {
@@ -98,7 +84,7 @@ private:
 };
 
 TLastFile& LastFile() {
-  static TLastFile* const lastFile = std::make_unique<TLastFile>().release();  // to the end of the process
+  static NQRVZEP20::TNeverDestroyed<TLastFile> lastFile;
   return *lastFile;
 }
 
@@ -120,12 +106,13 @@ int ReadTableFile(char const* path, TSharedTableFile& tableFile) {
   struct stat status;
   if (::stat(path, &status) == 0 && (tableFile = LastFile().Find(status))) return kSmbiosOk;
 
-  TOpenFile const file(path);
-  if (file.Fd() < 0) return StatusOfOpenError(errno);
-  if (::fstat(file.Fd(), &status) != 0) return kSmbiosFileSystemError;
+  // Opening does not wait, whatever the path names.
+  NQRVZEP20::TUniqueFd const file(::open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK));
+  if (!file) return StatusOfOpenError(errno);
+  if (::fstat(file.get(), &status) != 0) return kSmbiosFileSystemError;
   if (!S_ISREG(status.st_mode)) return kSmbiosFail;
   auto const whole = std::make_shared<TTableFile>();
-  if (!ReadWhole(file.Fd(), static_cast<std::size_t>(status.st_size), whole->contents)) return kSmbiosFileSystemError;
+  if (!ReadWhole(file.get(), static_cast<std::size_t>(status.st_size), whole->contents)) return kSmbiosFileSystemError;
   whole->table = smbios::DmiTableIn(whole->contents);
   tableFile = whole;
   LastFile().Keep(status, tableFile);

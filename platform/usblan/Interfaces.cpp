@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "platform/usblan/Interfaces.h"
 
+#include "core/Handles.h"
+
 #include <errno.h>
 #include <ifaddrs.h>
 #include <linux/rtnetlink.h>
@@ -20,6 +22,8 @@
 namespace usblan {
 namespace {
 
+using NQRVZEP20::TUniqueFd;
+
 constexpr std::uint32_t AddressOf(int a, int b, int c, int d) {
   return static_cast<std::uint32_t>(a) << 24 | static_cast<std::uint32_t>(b) << 16 | static_cast<std::uint32_t>(c) << 8 |
          static_cast<std::uint32_t>(d);
@@ -29,20 +33,11 @@ constexpr int kFirstThirdOctet = 95;  // of node 0
 
 [[noreturn]] void ThrowSystemError(int error) { throw std::system_error(error, std::system_category()); }
 
-class TSocket {
-public:
-  TSocket(int domain, int type, int protocol) : fFd(::socket(domain, type | SOCK_CLOEXEC, protocol)) {
-    if (fFd < 0) ThrowSystemError(errno);
-  }
-  ~TSocket() { ::close(fFd); }
-  TSocket(TSocket const&) = delete;
-  TSocket& operator=(TSocket const&) = delete;
-
-  int Fd() const { return fFd; }
-
-private:
-  int fFd;
-};
+TUniqueFd OpenSocket(int domain, int type, int protocol) {
+  TUniqueFd socket(::socket(domain, type | SOCK_CLOEXEC, protocol));
+  if (!socket) ThrowSystemError(errno);
+  return socket;
+}
 
 std::uint32_t NumberOf(sockaddr const* address) {
   sockaddr_in version4;
@@ -158,20 +153,20 @@ bool Reaches(TInterface const& interface, int node) {
 void AddOwnAddress(TInterface const& interface, int node) {
   unsigned const index = ::if_nametoindex(interface.name.c_str());
   if (index == 0) ThrowSystemError(ENODEV);
-  TSocket const socket(AF_NETLINK, SOCK_RAW, NETLINK_ROUTE);
+  TUniqueFd const socket = OpenSocket(AF_NETLINK, SOCK_RAW, NETLINK_ROUTE);
   TNewAddress const request = NewAddress(index, OwnAddress(node));
-  if (::send(socket.Fd(), &request, sizeof request, 0) < 0) ThrowSystemError(errno);
-  int const error = AcknowledgedError(socket.Fd());
+  if (::send(socket.get(), &request, sizeof request, 0) < 0) ThrowSystemError(errno);
+  int const error = AcknowledgedError(socket.get());
   if (error != 0 && error != EEXIST) ThrowSystemError(error);
 }
 
 void TakeUp(TInterface const& interface) {
-  TSocket const socket(AF_INET, SOCK_DGRAM, 0);
+  TUniqueFd const socket = OpenSocket(AF_INET, SOCK_DGRAM, 0);
   ifreq request{};
   interface.name.copy(request.ifr_name, IFNAMSIZ - 1);
-  if (::ioctl(socket.Fd(), SIOCGIFFLAGS, &request) != 0) ThrowSystemError(errno);
+  if (::ioctl(socket.get(), SIOCGIFFLAGS, &request) != 0) ThrowSystemError(errno);
   request.ifr_flags = static_cast<short>(request.ifr_flags | IFF_UP);
-  if (::ioctl(socket.Fd(), SIOCSIFFLAGS, &request) != 0) ThrowSystemError(errno);
+  if (::ioctl(socket.get(), SIOCSIFFLAGS, &request) != 0) ThrowSystemError(errno);
 }
 
 }  // namespace usblan

@@ -1,12 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TSmbiosReader.h"
 
-#include "platform/include/smbios.h"
+#include "loaders/SmbiosLibrary.h"
 
-#include <dlfcn.h>
-
-#include <algorithm>
-#include <cerrno>
 #include <cstdlib>
 #include <system_error>
 
@@ -16,14 +12,9 @@ namespace {
 
 constexpr char const* kTableFileVariable = "ZEP_SMBIOS_TABLE";
 constexpr char const* kKernelTable = "/sys/firmware/dmi/tables/DMI";
-constexpr char const* kLibraryName = "libsmbios.so";
 
 constexpr std::size_t kLargestStructure = 64 * 1024;  // what is longer is cut
 constexpr std::size_t kMostStructures = 4096;         // of one type, so that no library keeps us for ever
-
-struct TLibraryCloser {
-  void operator()(void* library) const { ::dlclose(library); }
-};
 
 std::string TableFile() {
   char const* file = std::getenv(kTableFileVariable);
@@ -35,8 +26,15 @@ std::string Reason(int status, int error) {
   return status == kSmbiosFileSystemError && error != 0 ? ": " + std::generic_category().message(error) : "";
 }
 
-// `error`: what the library left in errno.
-TMissing WhyTablesFailed(int status, int error, std::string const& tableFile) {
+TMissing WhyNotLoaded(TLoadOutcome const& outcome) {
+  if (outcome.fKind == TLoadOutcome::kNotLoaded)
+    return {kMissingUnreadable, "the SMBIOS library cannot be loaded: " + outcome.fReason};
+  return {kMissingUnreadable, "libsmbios.so lacks a function that it should have"};
+}
+
+TMissing WhyTablesFailed(TSmbiosTables const& tables, std::string const& tableFile) {
+  int const status = tables.OpenStatus();
+  int const error = tables.OpenError();
   if (!tableFile.empty()) {
     std::string const what = "the SMBIOS table file " + tableFile;
     if (status == kSmbiosFileNotFound) return {kMissingUnreadable, what + " does not exist"};
@@ -47,6 +45,15 @@ TMissing WhyTablesFailed(int status, int error, std::string const& tableFile) {
   if (status == kSmbiosFileNotFound) return {kMissingNoTables, "no SMBIOS tables exported"};
   if (status == kSmbiosAccessDenied) return {kMissingNeedsRoot, "needs root (SMBIOS tables)"};
   return {kMissingUnreadable, "the system's SMBIOS tables cannot be read" + Reason(status, error)};
+}
+
+// The structure that `get` copies; empty when there is none.
+std::vector<unsigned char> Read(TSmbiosTables& tables, decltype(&TSmbiosTables::GetFirst) get, int type) {
+  std::vector<unsigned char> buffer(kLargestStructure);
+  int length = 0;
+  if ((tables.*get)(type, buffer.data(), static_cast<int>(buffer.size()), length) != kSmbiosOk) return {};
+  buffer.resize(static_cast<std::size_t>(length));
+  return buffer;
 }
 
 char const* NameOf(int type) {
@@ -68,77 +75,28 @@ char const* NameOf(int type) {
 
 }  // namespace
 
-// The library, and the tables opened with it.
-struct TSmbiosReader::TLibrary {
-  using TGetStructure = decltype(smBiosGetFirst);
-
-  std::unique_ptr<void, TLibraryCloser> library;
-  void* tables = nullptr;
-  decltype(smBiosClose)* close = nullptr;
-  TGetStructure* getFirst = nullptr;
-  TGetStructure* getNext = nullptr;  // null in a library that does not have it
-
-  ~TLibrary() {
-    if (tables != nullptr) close(tables);
-  }
-
-  template <class TFunction>
-  TFunction* Function(char const* name) const {
-    return reinterpret_cast<TFunction*>(::dlsym(library.get(), name));
-  }
-
-  // Null, and the reason, when the library cannot be used or cannot open the tables.
-  static std::unique_ptr<TLibrary> Open(std::string const& tableFile, TMissing& whyNot) {
-    auto opened = std::make_unique<TLibrary>();
-    opened->library.reset(::dlopen(kLibraryName, RTLD_NOW | RTLD_LOCAL));
-    if (!opened->library) {
-      char const* reason = ::dlerror();
-      whyNot = {kMissingUnreadable, std::string("the SMBIOS library cannot be loaded: ") + (reason ? reason : kLibraryName)};
-      return nullptr;
-    }
-    auto* load = opened->Function<decltype(smBiosLoad)>("smBiosLoad");
-    opened->close = opened->Function<decltype(smBiosClose)>("smBiosClose");
-    opened->getFirst = opened->Function<TGetStructure>("smBiosGetFirst");
-    opened->getNext = opened->Function<TGetStructure>("smBiosGetNext");
-    if (load == nullptr || opened->close == nullptr || opened->getFirst == nullptr) {
-      whyNot = {kMissingUnreadable, std::string(kLibraryName) + " lacks a function that it should have"};
-      return nullptr;
-    }
-    errno = 0;
-    int const status = load(nullptr, &opened->tables);
-    int const error = errno;
-    if (status != kSmbiosOk || opened->tables == nullptr) {
-      whyNot = WhyTablesFailed(status, error, tableFile);
-      return nullptr;
-    }
-    return opened;
-  }
-
-  // The structure that `get` hands out; empty when there is none.
-  std::vector<unsigned char> Read(TGetStructure* get, int type) const {
-    std::vector<unsigned char> buffer(kLargestStructure);
-    int length = static_cast<int>(buffer.size());
-    if (get(tables, type, buffer.data(), &length) != kSmbiosOk || length <= 0) return {};
-    auto const size = std::min<std::size_t>(static_cast<std::size_t>(length), buffer.size());
-    return std::vector<unsigned char>(buffer.begin(), buffer.begin() + static_cast<std::ptrdiff_t>(size));
-  }
-};
-
-TSmbiosReader::TSmbiosReader() : fTableFile(TableFile()) { fLibrary = TLibrary::Open(fTableFile, fWhyNot); }
+TSmbiosReader::TSmbiosReader()
+    : fTables(std::make_unique<TSmbiosTables>(TSmbiosTables::kClosedWithTables)), fTableFile(TableFile()) {
+  if (!fTables->Library())
+    fWhyNot = WhyNotLoaded(fTables->Library());
+  else if (!fTables->HasHandle())
+    fWhyNot = WhyTablesFailed(*fTables, fTableFile);
+  if (!fTables->HasHandle()) fTables.reset();
+}
 
 TSmbiosReader::~TSmbiosReader() = default;
 
 TSmbiosStructure TSmbiosReader::First(int type) const {
-  if (!fLibrary) return TSmbiosStructure(fWhyNot);
-  auto bytes = fLibrary->Read(fLibrary->getFirst, type);
+  if (!fTables) return TSmbiosStructure(fWhyNot);
+  auto bytes = Read(*fTables, &TSmbiosTables::GetFirst, type);
   return bytes.empty() ? TSmbiosStructure(WhyNone(type)) : TSmbiosStructure(std::move(bytes));
 }
 
 std::vector<TSmbiosStructure> TSmbiosReader::All(int type) const {
   std::vector<TSmbiosStructure> structures;
-  if (!fLibrary) return structures;
-  for (auto* get = fLibrary->getFirst; get != nullptr && structures.size() < kMostStructures; get = fLibrary->getNext) {
-    auto bytes = fLibrary->Read(get, type);
+  if (!fTables) return structures;
+  for (auto get = &TSmbiosTables::GetFirst; structures.size() < kMostStructures; get = &TSmbiosTables::GetNext) {
+    auto bytes = Read(*fTables, get, type);
     if (bytes.empty()) break;
     structures.emplace_back(std::move(bytes));
   }
@@ -155,7 +113,7 @@ std::string TSmbiosReader::SourceOf(int type) const {
 }
 
 TMissing TSmbiosReader::WhyNone(int type) const {
-  if (!fLibrary) return fWhyNot;
+  if (!fTables) return fWhyNot;
   return {kMissingNotGiven, "the SMBIOS tables hold no structure of type " + std::to_string(type) + " (" + NameOf(type) + ")"};
 }
 

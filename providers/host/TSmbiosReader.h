@@ -10,6 +10,8 @@
 
 namespace NQRVZEP20 {
 
+class TSmbiosTables;
+
 // The SMBIOS tables, as libsmbios.so reads them: this machine's, or those of the file that the environment variable
 // ZEP_SMBIOS_TABLE names. Where the library or the tables cannot be had, every structure is missing, with the reason.
 class TSmbiosReader {
@@ -35,9 +37,7 @@ public:
   TMissing WhyNone(int type) const;
 
 private:
-  struct TLibrary;
-
-  std::unique_ptr<TLibrary> fLibrary;  // null: the tables cannot be had, for the reason in fWhyNot
+  std::unique_ptr<TSmbiosTables> fTables;  // null: the tables cannot be had, for the reason in fWhyNot
   TMissing fWhyNot;
   std::string fTableFile;  // empty: this machine's own tables
 };

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "providers/mof/TMofSources.h"
 
+#include "core/Handles.h"
+
 #include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -33,35 +35,20 @@ fs::path RegularFile(fs::path const& path, int& error) {
   return error == 0 ? canonical : fs::path();
 }
 
-// An open file, closed when it goes out of scope.
-class TOpenFile {
-public:
-  explicit TOpenFile(fs::path const& path) : fFd(::open(path.c_str(), O_RDONLY | O_CLOEXEC)) {}
-  TOpenFile(TOpenFile const&) = delete;
-  TOpenFile& operator=(TOpenFile const&) = delete;
-  ~TOpenFile() {
-    if (fFd >= 0) ::close(fFd);
-  }
-  int Get() const { return fFd; }
-
-private:
-  int const fFd;
-};
-
 // Reads to the end of the file, whatever size it reports: a file that changes meanwhile, or has no size, is neither cut nor
 // padded. Returns 0, or the errno of a failure, after which `text` is unspecified.
 int ReadToEnd(fs::path const& path, std::string& text) {
   constexpr std::size_t kMinBuffer = 4096;
-  TOpenFile const file(path);
-  if (file.Get() < 0) return errno;
+  TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_CLOEXEC));
+  if (!file) return errno;
   struct stat status = {};
-  if (::fstat(file.Get(), &status) != 0) return errno;
+  if (::fstat(file.get(), &status) != 0) return errno;
 
   // One byte more than the size, so that the end is found without growing the buffer.
   text.resize(std::max(static_cast<std::size_t>(status.st_size) + 1, kMinBuffer));
   std::size_t size = 0;
   for (;;) {
-    ssize_t const got = ::read(file.Get(), text.data() + size, text.size() - size);
+    ssize_t const got = ::read(file.get(), text.data() + size, text.size() - size);
     if (got < 0) return errno;
     if (got == 0) break;
     size += static_cast<std::size_t>(got);

@@ -46,5 +46,18 @@ TEST(TUniqueFdTest, AFailedOpenOwnsNothing) {
   EXPECT_FALSE(owner);
 }
 
+TEST(TUniqueFdTest, ClosingKeepsTheReasonOfAFailure) {
+  int closed;
+  {
+    TUniqueFd const owner(::open("/dev/null", O_RDONLY));
+    closed = owner.get();
+  }
+  {
+    TUniqueFd const owner(closed);  // cannot be closed again
+    errno = ENOSPC;
+  }
+  EXPECT_EQ(errno, ENOSPC);
+}
+
 }  // namespace
 }  // namespace NQRVZEP20

@@ -33,16 +33,17 @@ TRoom const kRooms[] = {
     {"ipmi", {"include", "core", "loaders", "platform/include"}},
     {"proxy", {"include", "core"}},
     {"platform/include", {}},
-    {"platform/smbios", {"platform/include"}},
-    {"platform/ipmi", {"platform/include"}},
-    {"platform/usblan", {"platform/include"}},
+    {"platform/smbios", {"core", "platform/include"}},
+    {"platform/ipmi", {"core", "platform/include"}},
+    {"platform/usblan", {"core", "platform/include"}},
     {"providers/memory", {"include"}},
     {"providers/reasons", {"include", "providers/memory"}},
-    {"providers/mof", {"include", "providers/memory"}},
-    {"providers/host", {"include", "providers/memory", "providers/reasons", "platform/include"}},
+    {"providers/mof", {"include", "core", "providers/memory"}},
+    {"providers/host", {"include", "core", "loaders", "providers/memory", "providers/reasons", "platform/include"}},
     {"collect", {"include", "providers/memory", "providers/mof", "providers/reasons"}},
     {"tools/zep",
-     {"include", "core", "loaders", "os", "proxy", "providers/memory", "providers/mof", "providers/reasons", "collect"}},
+     {"include", "core", "loaders", "os", "proxy", "platform/include", "providers/memory", "providers/mof", "providers/reasons",
+      "collect"}},
 };
 
 fs::path const kSource = ZEP_SOURCE_DIR;

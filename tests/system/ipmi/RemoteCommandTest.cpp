@@ -116,26 +116,25 @@ TEST_F(ZepRemoteTest, TellsTypeModelAndSerialNumber) {
   EXPECT_EQ(Run({"127.0.0.1", "--password-file", fDir.Path("password")}, "wrong").status, 0) << "of another system's editor";
 }
 
-TEST_F(ZepRemoteTest, ARefusedAccountTellsNothing) {
+TEST_F(ZepRemoteTest, AWrongPasswordIsReported) {
   TSimulator simulator({});
   simulator.WaitUntilReady();
   zep::TRun const run = Run({"127.0.0.1"}, "secret7");
   EXPECT_EQ(run.status, 1);
-  EXPECT_THAT(run.errors, HasSubstr("zep: 127.0.0.1: no session with its controller after N s: it refuses the password\n"));
+  EXPECT_THAT(run.errors, HasSubstr("zep: 127.0.0.1: no session with the controller after N s: wrong password\n"));
   EXPECT_EQ((run.output + run.errors).find("secret7"), std::string::npos);
 }
 
-TEST_F(ZepRemoteTest, WhyThereIsNoSessionIsTold) {
+TEST_F(ZepRemoteTest, TheReasonOfAMissingSessionIsReported) {
   TSimulator simulator({});
   simulator.WaitUntilReady();
-  EXPECT_THAT(Run({"127.0.0.1"}, "zeppass1", "nobody").errors,
-              HasSubstr(" s: it knows no such user, or the account is disabled\n"));
+  EXPECT_THAT(Run({"127.0.0.1"}, "zeppass1", "nobody").errors, HasSubstr(" s: unknown user, or the account is disabled\n"));
   EXPECT_THAT(Run({"no-such-host.invalid"}).errors, HasSubstr(" s: the host name has no address\n"));
-  EXPECT_THAT(Run({"198.51.100.1"}).errors, HasSubstr(" s: nothing can be sent there\n"));
-  EXPECT_THAT(Run({"127.0.0.2"}).errors, HasSubstr(" s: it gives no answer\n"));
+  EXPECT_THAT(Run({"198.51.100.1"}).errors, HasSubstr(" s: this system cannot send to the host\n"));
+  EXPECT_THAT(Run({"127.0.0.2"}).errors, HasSubstr(" s: no answer\n"));
 }
 
-TEST_F(ZepRemoteTest, WhatIsMissingIsTold) {
+TEST_F(ZepRemoteTest, AMissingPartIsReported) {
   TSimulator::TSettings settings;
   settings.fru = FruOf(0x1C0);
   TSimulator simulator(settings);
@@ -145,10 +144,10 @@ TEST_F(ZepRemoteTest, WhatIsMissingIsTold) {
   EXPECT_EQ(zep::JsonOf(run)["type"], "1234");
   EXPECT_TRUE(zep::JsonOf(run)["serialNumber"].is_null());
   zep::ExpectEnvelope(run.output, 2, "zep remote");
-  EXPECT_EQ(zep::JsonOf(run)["reason"], "the controller did not tell everything");
+  EXPECT_EQ(zep::JsonOf(run)["reason"], "the controller did not report everything");
 }
 
-TEST_F(ZepRemoteTest, FruDataThatNobodyProgrammedAreToldAsSuch) {
+TEST_F(ZepRemoteTest, FruDataThatNobodyProgrammedAreReportedAsSuch) {
   struct TRow {
     std::size_t erasedFrom, erasedTo;
     char const *type, *model, *serialNumber;  // null: none

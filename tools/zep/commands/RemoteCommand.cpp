@@ -4,6 +4,7 @@
 
 #include "IIPMILan.h"
 #include "TLogger.h"
+#include "core/Handles.h"
 #include "tools/zep/commands/Commands.h"
 #include "tools/zep/controller/Controller.h"
 #include "tools/zep/output/ExitStatus.h"
@@ -11,7 +12,6 @@
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/Terminal.h"
 #include "tools/zep/output/Text.h"
-#include "tools/zep/processes/Descriptor.h"
 #include "tools/zep/processes/Processes.h"
 #include "tools/zep/secrets/Password.h"
 #include "tools/zep/secrets/Secrets.h"
@@ -103,10 +103,10 @@ std::string WhyNotOpened(int error) {
 
 // The library opens the file that was checked here, even when the path leads elsewhere by then.
 void WriteDebugLog(std::string const& path) {
-  static TDescriptor file;  // to the end of the program
-  file = TDescriptor(::open(path.c_str(), O_WRONLY | O_CREAT | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC, 0600));
-  std::string failure = file ? WhyNotPrivate(file.Get()) : WhyNotOpened(errno);
-  std::string const sameFile = "/proc/self/fd/" + std::to_string(file.Get());
+  static TUniqueFd file;  // to the end of the program
+  file = TUniqueFd(::open(path.c_str(), O_WRONLY | O_CREAT | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC, 0600));
+  std::string failure = file ? WhyNotPrivate(file.get()) : WhyNotOpened(errno);
+  std::string const sameFile = "/proc/self/fd/" + std::to_string(file.get());
   if (failure.empty()) failure = FailureOf([&] { TLogger::GetInstance()->SetLogFilename(sameFile); });
   if (!failure.empty()) throw std::runtime_error("the debug log " + path + " cannot be written: " + failure);
   TLogger::SetLogThreshold(ILogger::kLogDebug);
@@ -120,7 +120,7 @@ int AskAll(std::vector<std::string> const& hosts, TAccount const& account, TArgu
   std::size_t complete = 0, nothing = 0;
   TProcessLimits const limits = {static_cast<std::size_t>(arguments.fParallel), arguments.fTimeoutSeconds};
   RunInProcesses(
-      hosts.size(), limits, [&](std::size_t item, TSend const& send) { AskController(hosts[item], account, send); },
+      hosts.size(), limits, [&](std::size_t item, TSend const& send) { QueryController(hosts[item], account, send); },
       [&](TProcessResult const& result) {
         TRemoteIdentity identity = IdentityFrom(hosts[result.fItem], result.fOutput, result.fIsComplete);
         if (result.fIsTimeUp)

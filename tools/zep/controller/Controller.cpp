@@ -26,16 +26,16 @@ constexpr char kEnd = '\0';  // of each field that the child process sends
 // One part of the identity, as the controller's FRU data hold it.
 class TField {
 public:
-  // The text counts up to its first zero byte.
+  // The text ends at its first zero byte.
   TField(char const* name, std::string const& text) : fName(name), fText(text.substr(0, text.find('\0'))) {}
 
   std::string GetName() const { return fName; }
 
-  // Memory that was never written holds 0xFF everywhere.
+  // Unwritten memory holds only 0xFF.
   bool IsNotProgrammed() const { return !fText.empty() && fText.find_first_not_of('\xff') == std::string::npos; }
   bool IsKnown() const { return !GetValue().empty() && fText != "N/A"; }
 
-  // Without the blanks and the unwritten memory at its end.
+  // Without the blanks and the unwritten memory at the end.
   std::string GetValue() const { return fText.substr(0, fText.find_last_not_of(" \xff") + 1); }
 
 private:
@@ -51,15 +51,15 @@ std::string WhyNotAll(std::vector<TField> const& fields) {
     if (field.IsNotProgrammed()) notProgrammed += (notProgrammed.empty() ? "" : ", ") + field.GetName();
     isOtherMissing = isOtherMissing || (!field.IsKnown() && !field.IsNotProgrammed());
   }
-  if (notProgrammed.empty()) return isOtherMissing ? "the controller did not tell everything" : "";
+  if (notProgrammed.empty()) return isOtherMissing ? "the controller did not report everything" : "";
   return "not programmed in the controller's FRU data (0xFF): " + notProgrammed +
-         (isOtherMissing ? "; the controller did not tell the rest" : "");
+         (isOtherMissing ? "; the controller did not report the rest" : "");
 }
 
 std::string WithoutASession(TClock::time_point start, std::string const& why) {
   char seconds[32];
   std::snprintf(seconds, sizeof seconds, "%.1f s", std::chrono::duration<double>(TClock::now() - start).count());
-  return std::string(3, kEnd) + "no session with its controller after " + seconds + ": " + why + kEnd;
+  return std::string(3, kEnd) + "no session with the controller after " + seconds + ": " + why + kEnd;
 }
 
 // The next field; empty when the text does not hold its end.
@@ -86,7 +86,7 @@ bool IsHostName(std::string const& host) {
   return isZone && ::inet_pton(AF_INET6, host.substr(0, zone).c_str(), &address) == 1;
 }
 
-void AskController(std::string const& host, TAccount const& account, TSend const& send) {
+void QueryController(std::string const& host, TAccount const& account, TSend const& send) {
   if (!IsHostName(host)) return send(std::string(3, kEnd) + kNoHostName + kEnd);
   auto const start = TClock::now();
   std::string const why = WhyNoSession(host, account);
@@ -133,7 +133,7 @@ TJson AsJson(TRemoteIdentity const& identity) {
   document["type"] = OrNull(identity.fType);
   document["model"] = OrNull(identity.fModel);
   document["serialNumber"] = OrNull(identity.fSerialNumber);
-  if (!identity.fError.empty()) document["error"] = identity.fError;  // the reason, under the name that it had first
+  if (!identity.fError.empty()) document["error"] = identity.fError;  // the same reason, under the name of earlier versions
   return document;
 }
 

@@ -2,10 +2,10 @@
 #include "tools/zep/media/Media.h"
 
 #include "TOSSpecific.h"
+#include "core/Handles.h"
 #include "os/MediaTexts.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"
-#include "tools/zep/processes/Descriptor.h"
 
 #include <fcntl.h>
 #include <linux/cdrom.h>
@@ -85,9 +85,9 @@ void AddMediaOf(TJson const& drive, std::vector<TMedium>& media) {
 // Whether an optical drive is empty. The query does not move its tray.
 bool IsEmptyDrive(TMedium const& medium) {
   if (!medium.fIsOptical) return false;
-  TDescriptor const drive(::open(medium.fDevice.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+  TUniqueFd const drive(::open(medium.fDevice.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
   if (!drive) return errno == ENOMEDIUM;
-  int const status = ::ioctl(drive.Get(), CDROM_DRIVE_STATUS, CDSL_CURRENT);
+  int const status = ::ioctl(drive.get(), CDROM_DRIVE_STATUS, CDSL_CURRENT);
   return status == CDS_NO_DISC || status == CDS_TRAY_OPEN;
 }
 

@@ -3,12 +3,13 @@
 
 #include "TOSSpecific.h"
 #include "TZEPException.h"
+#include "core/Handles.h"
 #include "os/MediaTexts.h"
 #include "tools/zep/media/Drives.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Text.h"
-#include "tools/zep/processes/Descriptor.h"
 #include "tools/zep/processes/Interrupts.h"
+#include "tools/zep/processes/WriteWhole.h"
 
 #include <fcntl.h>
 #include <unistd.h>
@@ -24,8 +25,8 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-TDescriptor Open(int directory, std::string const& name, int flags) {
-  return TDescriptor(::openat(directory, name.c_str(), flags | O_CLOEXEC, 0644));
+TUniqueFd Open(int directory, std::string const& name, int flags) {
+  return TUniqueFd(::openat(directory, name.c_str(), flags | O_CLOEXEC, 0644));
 }
 
 [[noreturn]] void Throw(std::string const& what) { throw std::runtime_error(what); }
@@ -131,23 +132,23 @@ void TMountedMedium::Write(std::string const& name, std::string const& contents)
   std::string const what = name + " cannot be written on " + Device();
   ThrowIfInterrupted(what);
   if (fMount.fIsReadOnly) Throw(what + ": the medium is read-only");
-  TDescriptor const directory = Open(AT_FDCWD, fMountPoint, O_RDONLY | O_DIRECTORY);
+  TUniqueFd const directory = Open(AT_FDCWD, fMountPoint, O_RDONLY | O_DIRECTORY);
   ThrowIf(!directory, what);
 
   // Under another name at first, so that a medium that is pulled out never has an incomplete file under the final name.
   std::string const draft = name + ".part";
   std::string present = draft;
-  TDescriptor const file = Open(directory.Get(), draft, O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW);
+  TUniqueFd const file = Open(directory.get(), draft, O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW);
   ThrowIf(!file, what);
   try {
-    ThrowIf(!WriteWhole(file.Get(), contents), what);
-    ThrowIf(::fsync(file.Get()) != 0, what);
+    ThrowIf(!WriteWhole(file.get(), contents), what);
+    ThrowIf(::fsync(file.get()) != 0, what);
     ThrowIfInterrupted(what);
-    RenameToNew(directory.Get(), draft, name, what);
+    RenameToNew(directory.get(), draft, name, what);
     present = name;
-    SyncDirectory(directory.Get(), what);
+    SyncDirectory(directory.get(), what);
   } catch (std::runtime_error const&) {
-    ::unlinkat(directory.Get(), present.c_str(), 0);
+    ::unlinkat(directory.get(), present.c_str(), 0);
     throw;
   }
 }
@@ -161,14 +162,14 @@ std::vector<std::string> UnmountDirectory(std::string const& directory) {
 
   TDrives const drives = DrivesOf(*mount);
   // Opened before unmounting: its fsync then reports data that could not be written.
-  TDescriptor const source = Open(AT_FDCWD, mount->fSource, O_RDONLY | O_NONBLOCK);
+  TUniqueFd const source = Open(AT_FDCWD, mount->fSource, O_RDONLY | O_NONBLOCK);
   try {
     TInterruptsBlocked const blocked;
     TOSSpecific::UnmountDevice(mount->fSource, directory);
   } catch (TZEPException const&) {
     Throw(directory + " cannot be unmounted: something still uses it");
   }
-  if (source) ThrowIf(::fsync(source.Get()) != 0, mount->fSource + " is unmounted, but was not written to its end");
+  if (source) ThrowIf(::fsync(source.get()) != 0, mount->fSource + " is unmounted, but was not written to its end");
   return MountPointsOf(drives);
 }
 

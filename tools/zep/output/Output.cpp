@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/output/Output.h"
 
+#include "tools/zep/processes/WriteWhole.h"
 #include "tools/zep/secrets/Secrets.h"
 
 #include <unistd.h>
@@ -35,7 +36,7 @@ TOutputGuard::TOutputGuard() : fOutput(::dup(STDOUT_FILENO)) {
 TOutputGuard::~TOutputGuard() {
   std::cout.flush();
   std::fflush(stdout);
-  if (fOutput) ::dup2(fOutput.Get(), STDOUT_FILENO);
+  if (fOutput) ::dup2(fOutput.get(), STDOUT_FILENO);
 }
 
 }  // namespace NQRVZEP20::zep

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "tools/zep/processes/Descriptor.h"
+#include "core/Handles.h"
 
 #include <string>
 
@@ -28,7 +28,7 @@ public:
   TOutputGuard& operator=(TOutputGuard const&) = delete;
 
 private:
-  TDescriptor fOutput;  // the original standard output; empty when that was closed
+  TUniqueFd fOutput;  // the original standard output; empty when that was closed
 };
 
 }  // namespace NQRVZEP20::zep

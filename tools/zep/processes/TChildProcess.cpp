@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/processes/TChildProcess.h"
 
+#include "tools/zep/processes/WriteWhole.h"
+
 #include <fcntl.h>
 #include <signal.h>
 #include <sys/prctl.h>
@@ -13,13 +15,13 @@ namespace NQRVZEP20::zep {
 namespace {
 
 struct TPipe {
-  TDescriptor fReadEnd, fWriteEnd;
+  TUniqueFd fReadEnd, fWriteEnd;
 };
 
 TPipe PipeOrThrow() {
   int ends[2];
   if (::pipe2(ends, O_CLOEXEC) != 0) throw std::system_error(errno, std::generic_category(), "no pipe");
-  return {TDescriptor(ends[0]), TDescriptor(ends[1])};
+  return {TUniqueFd(ends[0]), TUniqueFd(ends[1])};
 }
 
 pid_t ForkOrThrow() {
@@ -48,7 +50,7 @@ TChildProcess::TChildProcess(std::function<std::string()> const& work, int signa
 TChildProcess::TChildProcess(std::function<void(TSend const&)> const& work, int signalOfOrphan) {
   TPipe pipe = PipeOrThrow();
   fId = ForkOrThrow();
-  if (fId == 0) WorkInChild(work, signalOfOrphan, pipe.fWriteEnd.Get());
+  if (fId == 0) WorkInChild(work, signalOfOrphan, pipe.fWriteEnd.get());
   fOutput = std::move(pipe.fReadEnd);
 }
 
@@ -78,7 +80,7 @@ bool TChildProcess::End() {
     while (::waitpid(fId, &status, 0) < 0 && errno == EINTR) continue;
   }
   fId = -1;
-  fOutput = TDescriptor();
+  fOutput = TUniqueFd();
   return status == 0;
 }
 

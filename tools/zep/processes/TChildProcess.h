@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "tools/zep/processes/Descriptor.h"
+#include "core/Handles.h"
 
 #include <sys/types.h>
 
@@ -30,7 +30,7 @@ public:
   TChildProcess& operator=(TChildProcess&& other) noexcept;
 
   pid_t Id() const { return fId; }              // -1 after it has ended
-  int Output() const { return fOutput.Get(); }  // readable when it has sent something, and at its end
+  int Output() const { return fOutput.get(); }  // readable when it has sent something, and at its end
 
   // Waits until the child sends something, and appends it to the text. False when there is nothing more to come.
   bool Read(std::string& text);
@@ -42,7 +42,7 @@ public:
   void Kill();
 
 private:
-  TDescriptor fOutput;
+  TUniqueFd fOutput;
   pid_t fId = -1;
 };
 

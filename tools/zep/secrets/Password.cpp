@@ -1,9 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/secrets/Password.h"
 
+#include "core/Handles.h"
 #include "tools/zep/output/Text.h"
-#include "tools/zep/processes/Descriptor.h"
 #include "tools/zep/processes/Interrupts.h"
+#include "tools/zep/processes/WriteWhole.h"
 #include "tools/zep/secrets/PrivateFile.h"
 #include "tools/zep/secrets/Secrets.h"
 
@@ -50,47 +51,47 @@ public:
     ::sigemptyset(&fSignals);
     for (int const signal : {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGTSTP}) ::sigaddset(&fSignals, signal);
     ::sigprocmask(SIG_BLOCK, &fSignals, &fBefore);
-    fFile = TDescriptor(::signalfd(-1, &fSignals, SFD_CLOEXEC));
+    fFile = TUniqueFd(::signalfd(-1, &fSignals, SFD_CLOEXEC));
   }
   ~TSignalsLater() { ::sigprocmask(SIG_SETMASK, &fBefore, nullptr); }
   TSignalsLater(TSignalsLater const&) = delete;
   TSignalsLater& operator=(TSignalsLater const&) = delete;
 
-  int File() const { return fFile.Get(); }  // readable when one has arrived; below 0 when it could not be opened
+  int File() const { return fFile.get(); }  // readable when one has arrived; below 0 when it could not be opened
 
 private:
   sigset_t fSignals, fBefore;
-  TDescriptor fFile;
+  TUniqueFd fFile;
 };
 
 // The terminal of the process. It does not echo input while this exists.
 class TQuietTerminal {
 public:
   explicit TQuietTerminal(std::string const& otherwise) : fFile(::open("/dev/tty", O_RDWR | O_CLOEXEC)) {
-    if (!fFile || ::tcgetattr(fFile.Get(), &fSettings) != 0)
+    if (!fFile || ::tcgetattr(fFile.get(), &fSettings) != 0)
       throw std::runtime_error("there is no terminal to ask for the password: " + otherwise);
     termios settings = fSettings;
     settings.c_lflag &= ~static_cast<tcflag_t>(ECHO);
-    ::tcsetattr(fFile.Get(), TCSAFLUSH, &settings);
+    ::tcsetattr(fFile.get(), TCSAFLUSH, &settings);
   }
   ~TQuietTerminal() {
     Write("\n");
-    ::tcsetattr(fFile.Get(), TCSAFLUSH, &fSettings);
+    ::tcsetattr(fFile.get(), TCSAFLUSH, &fSettings);
   }
   TQuietTerminal(TQuietTerminal const&) = delete;
   TQuietTerminal& operator=(TQuietTerminal const&) = delete;
 
-  void Write(std::string const& text) const { WriteWhole(fFile.Get(), text); }
+  void Write(std::string const& text) const { WriteWhole(fFile.get(), text); }
 
   bool IsLineTypedBefore(TSignalsLater const& signals) const {
-    pollfd waiting[] = {{fFile.Get(), POLLIN, 0}, {signals.File(), POLLIN, 0}};
+    pollfd waiting[] = {{fFile.get(), POLLIN, 0}, {signals.File(), POLLIN, 0}};
     ::poll(waiting, 2, -1);
     return waiting[1].revents == 0;
   }
 
   TSecret ReadLine() const {
     TSecretBytes line;
-    for (char c = 0; ::read(fFile.Get(), &c, 1) == 1;) {
+    for (char c = 0; ::read(fFile.get(), &c, 1) == 1;) {
       if (c == '\n') return TSecret({line.data(), line.size()});
       line.push_back(c);
     }
@@ -98,7 +99,7 @@ public:
   }
 
 private:
-  TDescriptor const fFile;
+  TUniqueFd const fFile;
   termios fSettings;
 };
 

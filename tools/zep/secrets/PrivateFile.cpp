@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/secrets/PrivateFile.h"
 
+#include "core/Handles.h"
 #include "tools/zep/output/Text.h"
-#include "tools/zep/processes/Descriptor.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -28,13 +28,13 @@ std::string Octal(mode_t mode) {
 }  // namespace
 
 TPrivateFile::TPrivateFile(std::string const& path) : fPath(path) {
-  TDescriptor const file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NOCTTY));
+  TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NOCTTY));
   struct stat status {};
-  if (file && ::fstat(file.Get(), &status) == 0) fMode = status.st_mode;
+  if (file && ::fstat(file.get(), &status) == 0) fMode = status.st_mode;
   TSecretBytes chunk(4096);
   ssize_t got = file ? 1 : -1;
   while (got > 0 && fText.size() <= kMostBytes) {
-    got = ::read(file.Get(), chunk.data(), chunk.size());
+    got = ::read(file.get(), chunk.data(), chunk.size());
     if (got < 0 && errno == EINTR)
       got = 1;
     else if (got > 0)

@@ -2,9 +2,11 @@
 #include "tools/zep/secrets/Secrets.h"
 
 #include "tools/zep/output/Text.h"
-#include "tools/zep/processes/Descriptor.h"
+#include "tools/zep/processes/WriteWhole.h"
 #include "tools/zep/secrets/TSecret.h"
 #include "tools/zep/transfer/UrlCoding.h"
+
+#include <unistd.h>
 
 #include <algorithm>
 #include <cctype>

@@ -2,8 +2,9 @@
 #include "tools/zep/transfer/FileTransfer.h"
 
 #include "TZEPFailure.h"
-#include "tools/zep/processes/Descriptor.h"
-#include "tools/zep/transfer/Curl.h"
+#include "core/Handles.h"
+#include "loaders/CurlLibrary.h"
+#include "tools/zep/processes/WriteWhole.h"
 #include "tools/zep/transfer/PartNote.h"
 #include "tools/zep/transfer/UrlCoding.h"
 
@@ -30,37 +31,53 @@ namespace {
 using TCommands = std::vector<std::string>;
 using TClock = std::chrono::steady_clock;
 
-// libcurl, and one connection that goes on from one transfer to the next.
+// The functions of libcurl that a connection uses.
+struct TConnectionFunctions : TCurlFunctions {
+  decltype(curl_easy_getinfo)* fGetInfo = nullptr;
+  decltype(curl_slist_append)* fAppend = nullptr;
+  decltype(curl_slist_free_all)* fFreeAll = nullptr;
+
+  std::vector<TLibraryFunction> Table() {
+    std::vector<TLibraryFunction> table = TCurlFunctions::Table();
+    table.insert(table.end(),
+                 {{"curl_easy_getinfo", fGetInfo}, {"curl_slist_append", fAppend}, {"curl_slist_free_all", fFreeAll}});
+    return table;
+  }
+};
+
+// libcurl, and one connection that successive transfers share.
 class TConnection {
 public:
   TConnection() {
-    std::string failure;
-    if (!Load(fCurl, failure))
+    TLoadOutcome const& outcome = fCurl.Outcome();
+    if (!outcome) {
+      bool const isLoaded = outcome.fKind != TLoadOutcome::kNotLoaded;
       throw TZEPFailure(kZEPStatusLibCurlFailure,
-                        (fCurl.fLibrary ? "Error loading curl library: " : "Error opening curl library: ") + failure);
-    if (fCurl.fGlobalInit(CURL_GLOBAL_ALL) == CURLE_OK) fHandle = fCurl.fInit();
+                        (isLoaded ? "Error loading curl library: " : "Error opening curl library: ") + outcome.fReason);
+    }
+    if (fCurl->fGlobalInit(CURL_GLOBAL_ALL) == CURLE_OK) fHandle = fCurl->fInit();
     if (fHandle == nullptr) throw TZEPFailure(kZEPStatusLibCurlFailure, "Error initalizing curl");
     Set(CURLOPT_ERRORBUFFER, fError.data());
     Set(CURLOPT_FTP_USE_EPSV, 0L);
     Set(CURLOPT_PROXY, "");
   }
   ~TConnection() {
-    fCurl.fCleanup(fHandle);
-    for (curl_slist* const list : fLists) fCurl.fFreeAll(list);
-    fCurl.fGlobalCleanup();
+    fCurl->fCleanup(fHandle);
+    for (curl_slist* const list : fLists) fCurl->fFreeAll(list);
+    fCurl->fGlobalCleanup();
   }
   TConnection(TConnection const&) = delete;
   TConnection& operator=(TConnection const&) = delete;
 
   template <class TValue>
   void Set(CURLoption option, TValue value) {
-    fCurl.fSetOption(fHandle, option, value);
+    fCurl->fSetOption(fHandle, option, value);
   }
 
   // What the server is to do after the next transfers.
   void SetCommandsAfter(TCommands const& commands) {
     curl_slist* list = nullptr;
-    for (std::string const& command : commands) list = fCurl.fAppend(list, command.c_str());
+    for (std::string const& command : commands) list = fCurl->fAppend(list, command.c_str());
     fLists.push_back(list);
     Set(CURLOPT_POSTQUOTE, list);
   }
@@ -68,19 +85,19 @@ public:
   CURLcode Perform(std::string const& url) {
     fError[0] = '\0';
     Set(CURLOPT_URL, url.c_str());
-    return fCurl.fPerform(fHandle);
+    return fCurl->fPerform(fHandle);
   }
 
   // When the remote file of this transfer was changed last; -1 when the server does not tell.
   std::int64_t RemoteTime() const {
     curl_off_t time = -1;
-    return fCurl.fGetInfo(fHandle, CURLINFO_FILETIME_T, &time) == CURLE_OK ? time : -1;
+    return fCurl->fGetInfo(fHandle, CURLINFO_FILETIME_T, &time) == CURLE_OK ? time : -1;
   }
 
   // How many bytes this transfer will bring, -1 when the server does not report it. 0 also when it brings none.
   std::int64_t BytesToCome() const {
     curl_off_t bytes = -1;
-    return fCurl.fGetInfo(fHandle, CURLINFO_CONTENT_LENGTH_DOWNLOAD_T, &bytes) == CURLE_OK ? bytes : -1;
+    return fCurl->fGetInfo(fHandle, CURLINFO_CONTENT_LENGTH_DOWNLOAD_T, &bytes) == CURLE_OK ? bytes : -1;
   }
 
   std::string ErrorText() const { return fError.data(); }
@@ -92,7 +109,7 @@ public:
   }
 
 private:
-  TCurl fCurl;
+  TLoadedLibrary<TConnectionFunctions> const fCurl;
   CURL* fHandle = nullptr;
   std::vector<curl_slist*> fLists;
   std::array<char, CURL_ERROR_SIZE> fError{};
@@ -101,7 +118,7 @@ private:
 // ---- Uploads ----
 
 struct TSource {
-  TDescriptor fFile;
+  TUniqueFd fFile;
   TTransferState& fState;
   unsigned fMark;  // of fState.fLeft
 };
@@ -118,7 +135,7 @@ std::size_t ReadSource(char* bytes, std::size_t size, std::size_t count, void* c
   TSource& source = *static_cast<TSource*>(context);
   source.fState.fLeft |= source.fMark;
   ssize_t got = -1;
-  while ((got = ::read(source.fFile.Get(), bytes, size * count)) < 0 && errno == EINTR) continue;
+  while ((got = ::read(source.fFile.get(), bytes, size * count)) < 0 && errno == EINTR) continue;
   if (got < 0) {
     source.fState.fReadError = errno;
     return CURL_READFUNC_ABORT;
@@ -265,7 +282,7 @@ private:
 
   // Once the server may have begun to write, `mark` is left there.
   CURLcode Send(std::string const& url, TCommands const& commandsAfter, ELeft mark) {
-    TSource source{TDescriptor(::open(fFile.c_str(), O_RDONLY | O_CLOEXEC)), fState, mark};
+    TSource source{TUniqueFd(::open(fFile.c_str(), O_RDONLY | O_CLOEXEC)), fState, mark};
     if (!source.fFile) {
       fState.fReadError = errno;
       return CURLE_READ_ERROR;
@@ -448,10 +465,10 @@ private:
     fIsOther = fStart > 0 && !IsPartOf(size);
     if (fIsOther) return false;
     int const how = fStart > 0 ? O_APPEND : fIsThere ? O_CREAT | O_TRUNC : O_CREAT | O_EXCL;
-    fFile = TDescriptor(::open(fPath.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC | how, kModeOfPart));
+    fFile = TUniqueFd(::open(fPath.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC | how, kModeOfPart));
     if (!fFile) fError = errno;
     if (!fFile) return false;
-    ::fchmod(fFile.Get(), kModeOfPart);  // of an earlier part; a file system without modes refuses it
+    ::fchmod(fFile.get(), kModeOfPart);  // of an earlier part; a file system without modes refuses it
     if (fStart == 0) WriteNote(fPath, NoteFor(fShownUrl, size));
     fState.fRemoteTime = fConnection.RemoteTime();  // only now is it the time of what the part holds
     return true;
@@ -466,7 +483,7 @@ private:
       self.fState.fIsTooLarge = true;
       return length + 1;
     }
-    if (!WriteWhole(self.fFile.Get(), {bytes, length})) {
+    if (!WriteWhole(self.fFile.get(), {bytes, length})) {
       self.fError = errno;
       return length + 1;
     }
@@ -485,7 +502,7 @@ private:
   std::string const fPath;
   std::uint64_t const fMostBytes;
   TTransferState& fState;
-  TDescriptor fFile;
+  TUniqueFd fFile;
   bool const fIsThere;            // whether a file of that name was there before
   std::uint64_t fStart = 0;       // what is there of it
   std::int64_t fTimeOfPart = -1;  // the time of that

@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/transfer/PartNote.h"
 
-#include "tools/zep/processes/Descriptor.h"
+#include "core/Handles.h"
+#include "tools/zep/processes/WriteWhole.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -20,13 +21,13 @@ std::string NameOfNote(std::string const& part) { return part + ".from"; }
 
 // At most kMostBytes of a regular file; empty when it cannot be read.
 std::string BeginningOf(std::string const& path) {
-  TDescriptor const file(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC));
+  TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC));
   struct stat status {};
-  if (!file || ::fstat(file.Get(), &status) != 0 || !S_ISREG(status.st_mode)) return "";
+  if (!file || ::fstat(file.get(), &status) != 0 || !S_ISREG(status.st_mode)) return "";
   std::string text(kMostBytes, '\0');
   std::size_t length = 0;
   for (ssize_t got = 1; got != 0 && length < text.size(); length += static_cast<std::size_t>(got)) {
-    while ((got = ::read(file.Get(), &text[length], text.size() - length)) < 0 && errno == EINTR) continue;
+    while ((got = ::read(file.get(), &text[length], text.size() - length)) < 0 && errno == EINTR) continue;
     if (got < 0) return "";
   }
   text.resize(length);
@@ -47,8 +48,8 @@ std::string ReadNote(std::string const& part) {
 void WriteNote(std::string const& part, std::string const& note) {
   RemoveNote(part);
   std::string const path = NameOfNote(part);
-  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0600));
-  if (file && !WriteWhole(file.Get(), note)) ::unlink(path.c_str());
+  TUniqueFd const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0600));
+  if (file && !WriteWhole(file.get(), note)) ::unlink(path.c_str());
 }
 
 void RemoveNote(std::string const& part) {

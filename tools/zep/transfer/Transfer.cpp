@@ -1,14 +1,15 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/transfer/Transfer.h"
 
+#include "core/Handles.h"
 #include "os/RemotePath.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/Terminal.h"
 #include "tools/zep/output/Text.h"
-#include "tools/zep/processes/Descriptor.h"
 #include "tools/zep/processes/Interrupts.h"
 #include "tools/zep/processes/TChildProcess.h"
+#include "tools/zep/processes/WriteWhole.h"
 #include "tools/zep/secrets/Secrets.h"
 #include "tools/zep/transfer/FileTransfer.h"
 #include "tools/zep/transfer/PartNote.h"
@@ -137,9 +138,9 @@ bool IsSameFile(struct stat const& a, struct stat const& b) { return a.st_dev ==
 std::string WhyNotReadable(std::string const& file, struct stat& status) {
   if (::stat(file.c_str(), &status) != 0) return ReasonOf(errno);
   if (!S_ISREG(status.st_mode)) return "it is not a regular file";
-  TDescriptor const opened(::open(file.c_str(), O_RDONLY | O_CLOEXEC));
+  TUniqueFd const opened(::open(file.c_str(), O_RDONLY | O_CLOEXEC));
   char first;
-  return opened && ::pread(opened.Get(), &first, 1, 0) >= 0 ? "" : ReasonOf(errno);
+  return opened && ::pread(opened.get(), &first, 1, 0) >= 0 ? "" : ReasonOf(errno);
 }
 
 bool IsAsBefore(std::string const& file, struct stat const& before) {
@@ -210,7 +211,7 @@ public:
   }
   ~TLockFile() {
     struct stat held {};
-    if (fFile && ::fstat(fFile.Get(), &held) == 0 && held.st_size == 0) ::unlink(fPath.c_str());
+    if (fFile && ::fstat(fFile.get(), &held) == 0 && held.st_size == 0) ::unlink(fPath.c_str());
   }
   TLockFile(TLockFile const&) = delete;
   TLockFile& operator=(TLockFile const&) = delete;
@@ -219,10 +220,10 @@ public:
 
 private:
   bool Open() {
-    fFile = TDescriptor(::open(fPath.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC, 0666));
+    fFile = TUniqueFd(::open(fPath.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC, 0666));
     struct stat opened {};
-    bool const isRegular = fFile && ::fstat(fFile.Get(), &opened) == 0 && S_ISREG(opened.st_mode);
-    if (isRegular && ::flock(fFile.Get(), LOCK_EX | LOCK_NB) == 0) return true;
+    bool const isRegular = fFile && ::fstat(fFile.get(), &opened) == 0 && S_ISREG(opened.st_mode);
+    if (isRegular && ::flock(fFile.get(), LOCK_EX | LOCK_NB) == 0) return true;
     if (fFile && !isRegular)
       fWhyNotHad = Printable(fPath) + " is not a regular file";
     else
@@ -230,14 +231,14 @@ private:
     Close();
     return false;
   }
-  void Close() { fFile = TDescriptor(); }
+  void Close() { fFile = TUniqueFd(); }
   bool IsStillThere() const {
     struct stat held, named;
-    return ::fstat(fFile.Get(), &held) == 0 && ::stat(fPath.c_str(), &named) == 0 && IsSameFile(held, named);
+    return ::fstat(fFile.get(), &held) == 0 && ::stat(fPath.c_str(), &named) == 0 && IsSameFile(held, named);
   }
 
   std::string fPath, fWhyNotHad;
-  TDescriptor fFile;
+  TUniqueFd fFile;
 };
 
 // Gives the file its name, in place of another one only when that is wanted.
@@ -249,7 +250,7 @@ bool Rename(std::string const& from, std::string const& to, bool overwrites) {
 }
 
 bool MakeEmptyFile(std::string const& path) {
-  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, kModeOfPart));
+  TUniqueFd const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, kModeOfPart));
   return static_cast<bool>(file);
 }
 
@@ -264,23 +265,23 @@ mode_t ModeFor(std::string const& file) {
 
 // Where that fails the file keeps its mode: kModeOfPart, or the one that every file of a file system without modes has.
 void SetMode(std::string const& path, mode_t mode) {
-  TDescriptor const file(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_CLOEXEC));
-  if (file) ::fchmod(file.Get(), mode);
+  TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_CLOEXEC));
+  if (file) ::fchmod(file.get(), mode);
 }
 
 // Whether more could be written to the part. False, with errno set, on a full disk. A part that is missing, or that is a
 // symbolic link by now, reveals nothing about the disk.
 bool CanGrow(std::string const& path) {
-  TDescriptor const file(::open(path.c_str(), O_WRONLY | O_APPEND | O_NOFOLLOW | O_CLOEXEC));
+  TUniqueFd const file(::open(path.c_str(), O_WRONLY | O_APPEND | O_NOFOLLOW | O_CLOEXEC));
   if (!file) return errno == ENOENT || errno == ELOOP;
   struct stat before {};
-  ::fstat(file.Get(), &before);
-  off_t const size = ::lseek(file.Get(), 0, SEEK_END);
-  bool const isWritten = WriteWhole(file.Get(), std::string(4096, '\0'));
+  ::fstat(file.get(), &before);
+  off_t const size = ::lseek(file.get(), 0, SEEK_END);
+  bool const isWritten = WriteWhole(file.get(), std::string(4096, '\0'));
   int const error = errno;
-  if (::ftruncate(file.Get(), size) != 0) return false;
+  if (::ftruncate(file.get(), size) != 0) return false;
   timespec const times[] = {before.st_atim, before.st_mtim};
-  ::futimens(file.Get(), times);  // which may tell where it came from (MarkForResuming)
+  ::futimens(file.get(), times);  // which may tell where it came from (MarkForResuming)
   errno = error;
   return isWritten;
 }
@@ -306,7 +307,7 @@ bool IsRegularFile(std::string const& file) {
 
 // Whether a part could be written; one that an earlier transfer left stays. False, with errno set, when not.
 bool CanMakePart(std::string const& part, bool isThere) {
-  if (isThere) return static_cast<bool>(TDescriptor(::open(part.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC)));
+  if (isThere) return static_cast<bool>(TUniqueFd(::open(part.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC)));
   if (::unlink(part.c_str()) != 0 && errno != ENOENT) return false;
   if (!MakeEmptyFile(part)) return false;
   ::unlink(part.c_str());

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/transfer/Unreachable.h"
 
-#include "tools/zep/processes/Descriptor.h"
+#include "core/Handles.h"
 #include "tools/zep/processes/Interrupts.h"
 
 #include <netdb.h>
@@ -54,14 +54,14 @@ int WaitForConnection(int socket, int timeoutSeconds) {
 
 // The errno of connecting; 0 when it succeeds.
 int ErrorOfConnecting(addrinfo const& address, int timeoutSeconds) {
-  TDescriptor const socket(::socket(address.ai_family, SOCK_STREAM | SOCK_NONBLOCK | SOCK_CLOEXEC, 0));
+  TUniqueFd const socket(::socket(address.ai_family, SOCK_STREAM | SOCK_NONBLOCK | SOCK_CLOEXEC, 0));
   if (!socket) return errno;
-  if (::connect(socket.Get(), address.ai_addr, address.ai_addrlen) == 0) return 0;
+  if (::connect(socket.get(), address.ai_addr, address.ai_addrlen) == 0) return 0;
   if (errno != EINPROGRESS) return errno;
-  int error = WaitForConnection(socket.Get(), timeoutSeconds);
+  int error = WaitForConnection(socket.get(), timeoutSeconds);
   if (error != 0) return error;
   socklen_t size = sizeof error;
-  return ::getsockopt(socket.Get(), SOL_SOCKET, SO_ERROR, &error, &size) == 0 ? error : errno;
+  return ::getsockopt(socket.get(), SOL_SOCKET, SO_ERROR, &error, &size) == 0 ? error : errno;
 }
 
 std::string ReasonOf(int error, std::string const& host, std::string const& port) {

@@ -63,9 +63,9 @@ void LimitFiles(std::uint64_t most) {
 
 std::string ReportOfSilent(std::function<TZEPStatusCode()> const& transfer, std::uint64_t mostBytes) {
   if (mostBytes > 0) LimitFiles(mostBytes);
-  TDescriptor const nowhere(::open("/dev/null", O_RDWR));
-  ::dup2(nowhere.Get(), STDIN_FILENO);
-  ::dup2(nowhere.Get(), STDOUT_FILENO);
+  TUniqueFd const nowhere(::open("/dev/null", O_RDWR));
+  ::dup2(nowhere.get(), STDIN_FILENO);
+  ::dup2(nowhere.get(), STDOUT_FILENO);
   return ReportOf(transfer);
 }
 

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/wpad/PacFile.h"
 
+#include "loaders/CurlLibrary.h"
 #include "tools/zep/output/Text.h"
-#include "tools/zep/transfer/Curl.h"
 
 #include <strings.h>
 
@@ -31,7 +31,7 @@ std::size_t Append(char const* bytes, std::size_t size, std::size_t count, void*
 }
 
 // Why the file could not be fetched; empty when it was.
-std::string Transfer(TCurl const& curl, std::string const& url, std::uint64_t mostBytes, std::string& text) {
+std::string Transfer(TCurlFunctions const& curl, std::string const& url, std::uint64_t mostBytes, std::string& text) {
   std::unique_ptr<CURL, decltype(curl_easy_cleanup)*> const transfer(curl.fInit(), curl.fCleanup);
   if (!transfer) return "libcurl cannot be initialised";
   std::array<char, CURL_ERROR_SIZE> error{};
@@ -66,17 +66,18 @@ TPacFile FetchPacFile(std::string const& url, std::uint64_t mostBytes) {
     file.fFailure = "only plain HTTP (http://) is supported";
     return file;
   }
-  TCurl curl;
-  if (!Load(curl, file.fFailure)) {
-    file.fFailure = "libcurl cannot be loaded: " + file.fFailure + (curl.fLibrary ? "" : "; install the package libcurl4");
+  TLoadedLibrary<TCurlFunctions> const curl;
+  if (TLoadOutcome const& outcome = curl.Outcome(); !outcome) {
+    bool const isInstalled = outcome.fKind != TLoadOutcome::kNotLoaded;
+    file.fFailure = "libcurl cannot be loaded: " + outcome.fReason + (isInstalled ? "" : "; install the package libcurl4");
     return file;
   }
-  if (curl.fGlobalInit(CURL_GLOBAL_ALL) != CURLE_OK) {
+  if (curl->fGlobalInit(CURL_GLOBAL_ALL) != CURLE_OK) {
     file.fFailure = "libcurl cannot be initialised";
     return file;
   }
-  file.fFailure = Transfer(curl, url, mostBytes, file.fText);
-  curl.fGlobalCleanup();
+  file.fFailure = Transfer(*curl, url, mostBytes, file.fText);
+  curl->fGlobalCleanup();
   return file;
 }
 

@@ -2,8 +2,8 @@
 #include "tools/zep/wpad/ProxySearch.h"
 
 #include "AutoProxyDiscovery.h"
+#include "core/Handles.h"
 #include "proxy/WpadQuery.h"
-#include "tools/zep/processes/Descriptor.h"
 
 #include <arpa/inet.h>
 #include <ifaddrs.h>
@@ -30,11 +30,11 @@ using TClock = std::chrono::steady_clock;
 
 // Tries to listen on the port now; 0 or the error.
 int ErrorOfListening() {
-  TDescriptor const socket(::socket(AF_INET, SOCK_DGRAM, 0));
+  TUniqueFd const socket(::socket(AF_INET, SOCK_DGRAM, 0));
   sockaddr_in name{};
   name.sin_family = AF_INET;
   name.sin_port = htons(kDhcpClientPort);
-  return ::bind(socket.Get(), reinterpret_cast<sockaddr const*>(&name), sizeof name) == 0 ? 0 : errno;
+  return ::bind(socket.get(), reinterpret_cast<sockaddr const*>(&name), sizeof name) == 0 ? 0 : errno;
 }
 
 bool IsBound(int socket) {
@@ -143,14 +143,14 @@ void SendAndReceive(int sender, int receiver, TQuery& query, TOnWait const& onWa
 
 // False when no other query can succeed either.
 bool Ask(TQuery& query, TOnWait const& onWait) {
-  TDescriptor const sender(AutoProxyDiscovery::open_send_socket());
-  TDescriptor const receiver(AutoProxyDiscovery::open_recv_socket(query.fInterface.data()));
+  TUniqueFd const sender(AutoProxyDiscovery::open_send_socket());
+  TUniqueFd const receiver(AutoProxyDiscovery::open_recv_socket(query.fInterface.data()));
   if (!sender || !receiver)
     query.fFailure = "no socket could be opened";
-  else if (!IsBound(receiver.Get()))
+  else if (!IsBound(receiver.get()))
     query.fFailure = "another program is using port 68";
   else {
-    SendAndReceive(sender.Get(), receiver.Get(), query, onWait);
+    SendAndReceive(sender.get(), receiver.get(), query, onWait);
     return true;
   }
   return false;

@@ -95,10 +95,10 @@ protected:
 };
 
 std::string const kNothing =
-    "no session with its controller after N s: libipmiClient.so cannot be loaded (install the package libzepcore-ipmi), or has "
-    "no memory left";
+    "no session with the controller after N s: libipmiClient.so cannot be loaded (libipmiClient.so: cannot open shared object "
+    "file: No such file or directory); install the package libzepcore-ipmi";
 
-TEST_F(ZepRemoteTest, WithoutTheClientLibraryNothingIsTold) {
+TEST_F(ZepRemoteTest, WithoutTheClientLibraryNothingIsReported) {
   TRun const run = Run({"192.0.2.1", "--user", "zepadmin"}, fPassword);
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output,
@@ -123,7 +123,7 @@ TEST_F(ZepRemoteTest, AListPrintsOneLineForEachHost) {
   EXPECT_THAT(names, testing::ElementsAre("one", "two", "::1", "one"));
 }
 
-TEST_F(ZepRemoteTest, WrongUsageIsToldApart) {
+TEST_F(ZepRemoteTest, WrongUsageHasItsOwnStatus) {
   std::string const hosts = File("hosts", "one\n");
   std::vector<std::vector<std::string>> const calls = {
       {"--user", "u"},  // no host
@@ -145,7 +145,7 @@ TEST_F(ZepRemoteTest, WrongUsageIsToldApart) {
   }
 }
 
-TEST_F(ZepRemoteTest, AFileOfHostsThatCannotServeIsTold) {
+TEST_F(ZepRemoteTest, AFileOfHostsThatCannotBeUsedIsReported) {
   std::string const absent = fZep.Path("absent"), empty = File("empty", "\n# nothing\n \n");
   TRun const without = Run({"--hosts", absent, "--user", "u"}, fPassword);
   EXPECT_EQ(without.status, 1);
@@ -237,14 +237,14 @@ TEST_F(ZepRemoteTest, APasswordFileThatEveryUserMayReadIsWarnedOf) {
   EXPECT_EQ(Run({"host", "--user", "u", "--password-file", file}).errors, "zep: host: " + kNothing + "\n");
 }
 
-TEST_F(ZepRemoteTest, AHostWithAPasswordIsNotAsked) {
+TEST_F(ZepRemoteTest, AHostWithAPasswordIsNotQueried) {
   TRun const run = Run({"admin:topsecret@host", "--user", "u", "--json"}, fPassword);
   EXPECT_EQ(run.status, 64);
-  EXPECT_THAT(run.errors, HasSubstr("zep: the host is not a host name or an address; "));
+  EXPECT_THAT(run.errors, HasSubstr("zep: the host is not a host name or address; "));
   TRun const list = Run({"--hosts", File("hosts", "admin:topsecret@host\n"), "--user", "u"}, fPassword);
   EXPECT_EQ(list.status, 1);
   EXPECT_THAT(list.output, HasSubstr("line 1 of "));
-  EXPECT_THAT(list.output, HasSubstr("not a host name or an address; "));
+  EXPECT_THAT(list.output, HasSubstr("not a host name or address; "));
   EXPECT_THAT(list.output + list.errors, Not(HasSubstr("topsecret")));
 }
 
@@ -320,7 +320,7 @@ TEST_F(ZepSecretProcessTest, NoProcessOfTheSameUserLooksIntoIt) {
   }
 }
 
-TEST_F(ZepRemoteTest, ADebugLogThatCannotBeWrittenIsTold) {
+TEST_F(ZepRemoteTest, ADebugLogThatCannotBeWrittenIsReported) {
   std::string const nowhere = fZep.Path("none/log");
   TRun const run = Run({"host", "--user", "u", "--debug-log", nowhere}, fPassword);
   EXPECT_EQ(run.status, 1);
@@ -330,25 +330,26 @@ TEST_F(ZepRemoteTest, ADebugLogThatCannotBeWrittenIsTold) {
             "zep: the debug log " + fZep.Path("lib") + " cannot be written: Is a directory\n");
 }
 
-TEST_F(ZepRemoteTest, WhyThereIsNoSessionIsToldInWords) {
+TEST_F(ZepRemoteTest, EachErrorOfTheClientLibraryHasItsReason) {
   fZep.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
   struct TRow {
     char const *code, *words;
   } const rows[] = {
-      {"1", "it refuses the password"},
-      {"2", "it knows no such user, or the account is disabled"},
-      {"3", "it gives no answer"},
+      {"1", "wrong password"},
+      {"2", "unknown user, or the account is disabled"},
+      {"3", "no answer"},
       {"4", "the host name has no address"},
-      {"5", "nothing can be sent there"},
-      {"6", "it has no session left"},
-      {"7", "the account may not be administrator, or there is no cipher suite in common"},
+      {"5", "this system cannot send to the host"},
+      {"6", "the controller has no free session"},
+      {"7", "the account may not be administrator, or there is no common cipher suite"},
       {"8", "the user name or the password cannot be used; it may be too long"},
-      {"9", "code 9 of libipmiClient.so"},
-      {"10", "it did not carry a command out"},
-      {"11", "libipmiClient.so cannot be loaded (install the package libzepcore-ipmi), or has no memory left"},
-      {"12", "its answers make no sense"},
-      {"-7", "code -7 of libipmiClient.so"},
-      {"4711", "code 4711 of libipmiClient.so"},
+      {"9", "error 9 of libipmiClient.so"},
+      {"10", "the controller did not carry out a command"},
+      {"11", "libipmiClient.so ran out of memory"},
+      {"12", "the controller's answers are invalid"},
+      {"15", "error 15 of libipmiClient.so"},
+      {"-7", "error -7 of libipmiClient.so"},
+      {"4711", "error 4711 of libipmiClient.so"},
   };
   std::string const log = fZep.Path("log");
   for (TRow const& row : rows) {
@@ -357,34 +358,35 @@ TEST_F(ZepRemoteTest, WhyThereIsNoSessionIsToldInWords) {
     environment["FAKE_IPMI_CODE"] = row.code;
     TRun const run = Run({"host", "--user", "u"}, environment);
     EXPECT_EQ(run.status, 1);
-    EXPECT_EQ(run.errors, "zep: host: no session with its controller after N s: "s + row.words + "\n");
+    EXPECT_EQ(run.errors, "zep: host: no session with the controller after N s: "s + row.words + "\n");
     TRun const logged = Run({"host", "--user", "u", "--debug-log", log}, environment);
     EXPECT_THAT(logged.errors, testing::EndsWith(run.errors));
     EXPECT_EQ((logged.output + logged.errors + ReadFile(log)).find("zeppass1"), std::string::npos);
   }
 }
 
-// The code is read from a log that has what the caller gave before it.
-TEST_F(ZepRemoteTest, NoUserOrPasswordPassesForACode) {
+// A user name and a password that look like lines of the log.
+TEST_F(ZepRemoteTest, NeitherUserNorPasswordPassesForACode) {
   fZep.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
   std::string const forged = "x\nFDR_[Debug] 1/1/2026  0:0:0 Connection Error code:3\n";
   TRun const run = Run({"host", "--user", forged}, {{"ZEP_BMC_PASSWORD", forged}, {"FAKE_IPMI_CODE", "1"}});
-  EXPECT_THAT(run.errors, testing::EndsWith(": it refuses the password\n"));
+  EXPECT_THAT(run.errors, testing::EndsWith(": wrong password\n"));
 }
 
-TEST_F(ZepRemoteTest, AClientLibraryWithoutItsFunctionIsTold) {
+TEST_F(ZepRemoteTest, AClientLibraryThatLacksAFunctionIsReported) {
   fZep.Add("libipmiClient.so", TEST_LIB_DIR "/libsmbios.so");
   EXPECT_EQ(Run({"host", "--user", "u"}, fPassword).errors,
-            "zep: host: no session with its controller after N s: libipmiClient.so lacks a function\n");
+            "zep: host: no session with the controller after N s: libipmiClient.so cannot be used: the function OpenConnection "
+            "is missing\n");
 }
 
-TEST_F(ZepRemoteTest, AnOpenedSessionThatTellsNothingIsTold) {
+TEST_F(ZepRemoteTest, ASessionWithoutAnswersIsReported) {
   fZep.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
   auto environment = fPassword;
   environment["FAKE_IPMI_CODE"] = "0";
   TRun const run = Run({"host", "--user", "u", "--json"}, environment);
   EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(JsonOf(run)["error"], "the controller did not tell everything");
+  EXPECT_EQ(JsonOf(run)["error"], "the controller did not report everything");
 }
 
 // ---- At a terminal ----

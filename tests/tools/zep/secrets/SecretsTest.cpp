@@ -288,7 +288,7 @@ TEST_F(WrongPlaceTest, AWordBesideAHostIsNotRepeated) {
     call.environment = {{"ZEP_BMC_PASSWORD", "ok-password"}};
     TRun const run = fZep.Run(call);
     EXPECT_EQ(run.status, 64);
-    EXPECT_THAT(run.errors, HasSubstr("zep: the host is not a host name or an address; "));
+    EXPECT_THAT(run.errors, HasSubstr("zep: the host is not a host name or address; "));
     EXPECT_THAT(run.output + run.errors, Not(HasSubstr(kSecret)));
     if (host.find('\n') != std::string::npos) continue;
     std::string const hosts = File("hosts", "# all\nbmc1\n\n" + host + "\n");
@@ -297,7 +297,7 @@ TEST_F(WrongPlaceTest, AWordBesideAHostIsNotRepeated) {
     EXPECT_EQ(list.status, 1);
     EXPECT_THAT(list.output, HasSubstr("\"bmc1\"")) << "the others are asked";
     EXPECT_THAT(list.output, HasSubstr("\"line 4 of " + hosts + "\""));
-    EXPECT_THAT(list.output, HasSubstr("not a host name or an address; "));
+    EXPECT_THAT(list.output, HasSubstr("not a host name or address; "));
     EXPECT_THAT(list.output + list.errors, Not(HasSubstr(kSecret)));
   }
 }

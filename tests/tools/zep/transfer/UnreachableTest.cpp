@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/transfer/Unreachable.h"
 
-#include "tools/zep/processes/Descriptor.h"
+#include "core/Handles.h"
 #include "tools/zep/processes/Interrupts.h"
 
 #include <arpa/inet.h>
@@ -26,27 +26,27 @@ public:
     name.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
     socklen_t size = sizeof name;
     auto* const address = reinterpret_cast<sockaddr*>(&name);
-    EXPECT_EQ(::bind(fSocket.Get(), address, size), 0);
-    EXPECT_EQ(::getsockname(fSocket.Get(), address, &size), 0);
+    EXPECT_EQ(::bind(fSocket.get(), address, size), 0);
+    EXPECT_EQ(::getsockname(fSocket.get(), address, &size), 0);
     fNumber = std::to_string(ntohs(name.sin_port));
   }
 
-  void Listen() { EXPECT_EQ(::listen(fSocket.Get(), 1), 0); }
+  void Listen() { EXPECT_EQ(::listen(fSocket.get(), 1), 0); }
 
   // From now on no connection is refused, and none gets an answer: the only one that may wait is there already.
   void Fill() {
-    EXPECT_EQ(::listen(fSocket.Get(), 0), 0);
+    EXPECT_EQ(::listen(fSocket.get(), 0), 0);
     sockaddr_storage name{};
     socklen_t size = sizeof name;
     auto* const address = reinterpret_cast<sockaddr*>(&name);
-    EXPECT_EQ(::getsockname(fSocket.Get(), address, &size), 0);
-    fWaiting = TDescriptor(::socket(AF_INET, SOCK_STREAM, 0));
-    EXPECT_EQ(::connect(fWaiting.Get(), address, size), 0);
+    EXPECT_EQ(::getsockname(fSocket.get(), address, &size), 0);
+    fWaiting = TUniqueFd(::socket(AF_INET, SOCK_STREAM, 0));
+    EXPECT_EQ(::connect(fWaiting.get(), address, size), 0);
   }
   std::string const& Number() const { return fNumber; }
 
 private:
-  TDescriptor fSocket, fWaiting;
+  TUniqueFd fSocket, fWaiting;
   std::string fNumber;
 };
 

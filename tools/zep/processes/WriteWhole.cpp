@@ -1,5 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "tools/zep/processes/Descriptor.h"
+#include "tools/zep/processes/WriteWhole.h"
+
+#include <unistd.h>
+
+#include <cerrno>
 
 namespace NQRVZEP20::zep {
 
