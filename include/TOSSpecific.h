@@ -51,7 +51,7 @@ struct TRemovableMedium {
 // of an operation says otherwise.
 class ZEP_EXPORT TOSSpecific {
 public:
-  // ---- Files, directories, paths and environment (TOSSpecificFiles.cpp) ----
+  // ---- Files and directories (TOSSpecificFiles.cpp) ----
 
   // FileExists is true for anything that exists and is not a directory: devices, pipes and sockets count as files. DirExists
   // is true for directories only. Both follow links.
@@ -65,18 +65,6 @@ public:
 
   // The size in bytes. Throws kZEPStatusFileNotFound when FileExists is false or the file cannot be examined.
   static long GetFileSize(std::string path);
-
-  // Copies the contents of a file. A missing destination is created with the source's permission bits minus the umask. An
-  // existing destination keeps its own bits and is not truncated: if it is longer than the source, the rest of its old
-  // contents remains. A short write is neither completed nor reported. Kept. Any other failure throws
-  // kZEPStatusFileSystemError; the part already copied remains.
-  static void FileCopy(std::string from, std::string to);
-
-  // Copies the files of a directory, following links, and with `recursive` also its subdirectories. `to` is created when it
-  // is missing, but its parents are not. An entry that cannot be examined, such as a dangling link, is skipped. Kept. Returns
-  // the result of closing the source directory, 0. Throws kZEPStatusFileSystemError when a directory cannot be opened;
-  // exceptions of CreateDir and FileCopy pass through. The files already copied remain.
-  static int DirCopy(std::string from, std::string to, bool recursive);
 
   // The names, not the paths, of all entries except "." and "..", in the order in which the system lists them. Throws
   // kZEPStatusFileSystemError when the directory cannot be opened.
@@ -99,6 +87,22 @@ public:
   // stream's exception mask makes the stream throw. The mask does not change; after a failure the stream's state is failbit.
   static void OpenOutputFileStream(std::ofstream& stream, std::string path);
 
+  // ---- Copies (TOSSpecificCopy.cpp) ----
+
+  // Copies the contents of a file. A missing destination is created with the source's permission bits minus the umask. An
+  // existing destination keeps its own bits and is not truncated: if it is longer than the source, the rest of its old
+  // contents remains. A short write is neither completed nor reported. Kept. Any other failure throws
+  // kZEPStatusFileSystemError; the part already copied remains.
+  static void FileCopy(std::string from, std::string to);
+
+  // Copies the files of a directory, following links, and with `recursive` also its subdirectories. `to` is created when it
+  // is missing, but its parents are not. An entry that cannot be examined, such as a dangling link, is skipped. Kept. Returns
+  // the result of closing the source directory, 0. Throws kZEPStatusFileSystemError when a directory cannot be opened;
+  // exceptions of CreateDir and FileCopy pass through. The files already copied remain.
+  static int DirCopy(std::string from, std::string to, bool recursive);
+
+  // ---- Paths and environment (TOSSpecificEnvironment.cpp) ----
+
   // The working directory. Throws kZEPStatusFail when it cannot be determined or its path is longer than 1023 bytes.
   static std::string GetCurrentDir();
 
@@ -117,6 +121,8 @@ public:
   // True for the OEM variant of the collector: the file "docs/oem_zep_preboot_readme.txt" exists in the working directory.
   static bool isOEMBuild();
 
+  // ---- Texts (TOSSpecificText.cpp) ----
+
   // Reduces a BIOS identifier to the text in its brackets: erases everything up to and including the first "[", then the
   // first "]" and everything after it. "-[ABC123-1.05]-" becomes "ABC123-1.05". Always returns true. Kept.
   static bool removeNonAlpaNumeric(std::string& text);
@@ -131,12 +137,7 @@ public:
   // larger than the offset of the last string's zero byte. Reads no byte at or after the offset `length`.
   static std::vector<std::string> multiStringTok(char* buffer, unsigned long length, char separator);
 
-  // ---- Console, time and host probes (TOSSpecificConsole.cpp) ----
-
-  // The current local time, to the millisecond. The UTC offset is that of the zone's standard time, plus 60 minutes while
-  // daylight saving is in force. It is therefore wrong in a zone that shifts by another amount, such as 30 minutes, or -60 in
-  // Ireland's winter. Kept. TZ is read on each call.
-  static TCIMDateTime GetLocalTime();
+  // ---- Keyboard (TOSSpecificKeyboard.cpp) ----
 
   // Whether standard input has data to read, such as a key press; also true when select fails. Kept. Never blocks. The local
   // modes of the terminal (echo, waiting for Enter, signals from keys) are off during the call. Do not call it from two
@@ -147,6 +148,13 @@ public:
   // not echoed and Enter is not needed. It is read directly from the descriptor: data that std::cin or stdin has already
   // buffered is not seen. Do not call it from two threads at once.
   static int GetKeyboardChar();
+
+  // ---- Console, time and host probes (TOSSpecificConsole.cpp) ----
+
+  // The current local time, to the millisecond. The UTC offset is that of the zone's standard time, plus 60 minutes while
+  // daylight saving is in force. It is therefore wrong in a zone that shifts by another amount, such as 30 minutes, or -60 in
+  // Ireland's winter. Kept. TZ is read on each call.
+  static TCIMDateTime GetLocalTime();
 
   // Sleeps for `milliseconds`, despite its name. Kept. Returns 0, or -1 when a signal ended the sleep early.
   static int USleep(unsigned int milliseconds);
@@ -169,7 +177,7 @@ public:
   static void setZEPParser(bool value);
   static bool isZEPParser();
 
-  // ---- Processes and captured output (TOSSpecificProcess.cpp) ----
+  // ---- Processes (TOSSpecificProcess.cpp) ----
   //
   // The standard output and standard error of a child go to one pipe. The caller's thread reads it until the last process
   // that has it open closes it. The child inherits everything else: standard input, every open descriptor that is not marked
@@ -203,6 +211,8 @@ public:
   // The same with a command line, which is split at every single blank: two blanks in a row, or one at the end, give an
   // empty argument. Quotes have no special meaning. Kept.
   static std::string SpawnProcess(std::string commandLine, int timeout);
+
+  // ---- Captured files (TOSSpecificCapture.cpp) ----
 
   // Runs a program that writes the file `fileName`, and reads that file into `contents`. The timeout is 300 seconds; the
   // output and the result of the program are ignored. Kept. Does not throw: a failure to read the file or to start a process
@@ -311,6 +321,8 @@ public:
   // or after the offset `length`.
   static int getBIDString(char* stringSet, char* output, int length, int number);
 
+  // ---- Remote identity (TOSSpecificRemote.cpp) ----
+  //
   // The identity of a remote server, read from the FRU data of its management controller with IPMI over the LAN (port 623)
   // through the platform library libipmiClient.so: serial number (GetRemoteMSN), machine type (GetRemoteMT) and model. Each
   // call opens a session, which replaces the one that was open, and leaves it open. Kept. The result is empty when no session
@@ -319,13 +331,6 @@ public:
   static std::string GetRemoteMSN(std::string host, std::string user, std::string password);
   static std::string GetRemoteMT(std::string host, std::string user, std::string password);
   static std::string GetRemoteMachineModel(std::string host, std::string user, std::string password);
-
-  // Marks the start of a debug session: creates or truncates the file "<path><machine type><local time>.log", such as
-  // "/tmp/zep_123420240303-090507.log" for the `path` "/tmp/zep_". A null `path` stands for "/var/log/QRV_Support/zep_", in
-  // the OEM variant for "/var/log/OEM_Support/zep_". The complete path is cut after 255 bytes. Nothing is written to the
-  // file, and a failure to create it is not reported. Kept. Then, if `level` is 0 to 4, sets the logger's threshold to it and
-  // returns true; any other level leaves the threshold unchanged and returns false.
-  static bool SetDebugLevel(int level, char* path);
 
   // ---- File transfer (TOSSpecificTransfer.cpp) ----
   //
@@ -424,6 +429,13 @@ public:
   // Writes one line to the system log, under the identity "YBNQ": severity kLogError as LOG_ERR, kLogWarning as LOG_WARNING,
   // any other as LOG_NOTICE. The last argument is not used.
   static void LogSELEvent(char const* text, ILogger::EZEPLogSeverity severity, int unused);
+
+  // Marks the start of a debug session: creates or truncates the file "<path><machine type><local time>.log", such as
+  // "/tmp/zep_123420240303-090507.log" for the `path` "/tmp/zep_". A null `path` stands for "/var/log/QRV_Support/zep_", in
+  // the OEM variant for "/var/log/OEM_Support/zep_". The complete path is cut after 255 bytes. Nothing is written to the
+  // file, and a failure to create it is not reported. Kept. Then, if `level` is 0 to 4, sets the logger's threshold to it and
+  // returns true; any other level leaves the threshold unchanged and returns false.
+  static bool SetDebugLevel(int level, char* path);
 };
 
 }  // namespace NQRVZEP20

@@ -16,6 +16,11 @@ inline TUniqueDir OpenDirOrThrow(std::string const& path) {
   return dir;
 }
 
+inline std::string WithTrailingSeparator(std::string path) {
+  if (path.empty() || path.back() != '/') path += '/';
+  return path;
+}
+
 inline bool IsDotOrDotDot(std::string const& name) { return name == "." || name == ".."; }
 
 }  // namespace NQRVZEP20

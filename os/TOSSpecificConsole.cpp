@@ -3,44 +3,14 @@
 
 #include "os/LocalTime.h"
 
-#include <sys/select.h>
-#include <termios.h>
 #include <unistd.h>
 
-#include <cstdio>
 #include <cstdlib>
 
 namespace NQRVZEP20 {
 
 bool isLuz = false;
 bool isParser = false;
-
-namespace {
-
-// Hands single keys on as they are typed: all local modes of the terminal on standard input are off, and one key is
-// enough for a read. Its settings come back at the end. Anything but a terminal is left as it is.
-class TSingleKeys {
-public:
-  TSingleKeys() : fIsTerminal(::tcgetattr(STDIN_FILENO, &fSettings) == 0) {
-    if (!fIsTerminal) return;
-    termios settings = fSettings;
-    settings.c_lflag = 0;
-    settings.c_cc[VMIN] = 1;
-    settings.c_cc[VTIME] = 0;
-    ::tcsetattr(STDIN_FILENO, TCSANOW, &settings);
-  }
-  ~TSingleKeys() {
-    if (fIsTerminal) ::tcsetattr(STDIN_FILENO, TCSANOW, &fSettings);
-  }
-  TSingleKeys(TSingleKeys const&) = delete;
-  TSingleKeys& operator=(TSingleKeys const&) = delete;
-
-private:
-  termios fSettings;
-  bool fIsTerminal;
-};
-
-}  // namespace
 
 TCIMDateTime TOSSpecific::GetLocalTime() {
   TLocalTime const& now = TLocalClock().Now();
@@ -49,22 +19,6 @@ TCIMDateTime TOSSpecific::GetLocalTime() {
                       static_cast<unsigned int>(fields.tm_mday), static_cast<unsigned short>(fields.tm_hour),
                       static_cast<unsigned short>(fields.tm_min), static_cast<unsigned short>(fields.tm_sec),
                       now.fMilliseconds * 1000, now.fUTCOffset);
-}
-
-bool TOSSpecific::IsKeyWaiting() {
-  TSingleKeys const singleKeys;
-  fd_set readable;
-  FD_ZERO(&readable);
-  FD_SET(STDIN_FILENO, &readable);
-  timeval noTime{0, 0};
-  return ::select(STDIN_FILENO + 1, &readable, nullptr, nullptr, &noTime) != 0;  // also true when select fails. Kept.
-}
-
-int TOSSpecific::GetKeyboardChar() {
-  TSingleKeys const singleKeys;
-  // Past stdio, which would take more than this one character out of IsKeyWaiting's sight.
-  unsigned char character;
-  return ::read(STDIN_FILENO, &character, 1) == 1 ? character : EOF;
 }
 
 int TOSSpecific::USleep(unsigned int milliseconds) {

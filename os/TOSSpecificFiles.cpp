@@ -24,64 +24,7 @@ namespace {
   throw TZEPException(kZEPStatusFileSystemError);
 }
 
-// ---- Copies ----
-
-struct stat StatusOrThrow(std::string const& path) {
-  struct stat status;
-  if (::stat(path.c_str(), &status) != 0) throw TZEPException(kZEPStatusFileSystemError);
-  return status;
-}
-
-TUniqueFd OpenOrThrow(std::string const& path, int flags, mode_t mode = 0) {
-  TUniqueFd file(::open(path.c_str(), flags, mode));
-  if (!file) throw TZEPException(kZEPStatusFileSystemError);
-  return file;
-}
-
-constexpr off_t kLargeFile = 1 << 20;
-constexpr std::size_t kChunkSize = 32768;
-
-// Takes a large file through the kernel, which copies faster than a buffer here. How far that gets does not matter: both
-// descriptors are left at the start of a chunk, and CopyRest goes on from there to the end or to the reason of the stop.
-void CopyInKernel(int from, int to) {
-  constexpr std::size_t kAtATime = 1 << 30;
-  off_t copied = 0;
-  for (ssize_t got; (got = ::copy_file_range(from, nullptr, to, nullptr, kAtATime, 0)) > 0;) copied += got;
-  if (copied == 0) return;  // an end may be a pipe, in which there are no places to go to
-  off_t const start = copied - copied % static_cast<off_t>(kChunkSize);
-  if (::lseek(from, start, SEEK_SET) != start || ::lseek(to, start, SEEK_SET) != start)
-    throw TZEPException(kZEPStatusFileSystemError);
-}
-
-// Returns the last result of read or write: 0 at the end of the source, below 0 for a failure.
-ssize_t CopyRest(int from, int to) {
-  char buffer[kChunkSize];
-  for (;;) {
-    ssize_t const got = ::read(from, buffer, sizeof buffer);
-    if (got <= 0) return got;
-    // What a short write left out is not written again. Kept.
-    ssize_t const put = ::write(to, buffer, static_cast<std::size_t>(got));
-    if (put <= 0) return put;
-  }
-}
-
-// ---- Directories ----
-
-std::string WithTrailingSeparator(std::string path) {
-  if (path.empty() || path.back() != '/') path += '/';
-  return path;
-}
-
-void CopyEntry(std::string const& from, std::string const& to, bool recursive) {
-  struct stat status;
-  if (::stat(from.c_str(), &status) != 0) return;
-  if (!S_ISDIR(status.st_mode))
-    TOSSpecific::FileCopy(from, to);
-  else if (recursive)
-    TOSSpecific::DirCopy(from, to, true);
-}
-
-// A last line without its newline counts as well.
+// A last line counts even without its newline.
 std::vector<std::string> LinesOf(std::string const& text) {
   std::vector<std::string> lines;
   for (std::size_t start = 0; start < text.size();) {
@@ -140,26 +83,6 @@ long TOSSpecific::GetFileSize(std::string path) {
   return status.st_size;
 }
 
-void TOSSpecific::FileCopy(std::string from, std::string to) {
-  struct stat const status = StatusOrThrow(from);
-  TUniqueFd const source = OpenOrThrow(from, O_RDONLY);
-  // Not truncated: behind a shorter source the destination keeps its old tail. Kept.
-  TUniqueFd const destination = OpenOrThrow(to, O_WRONLY | O_CREAT, status.st_mode);
-
-  if (S_ISREG(status.st_mode) && status.st_size >= kLargeFile) CopyInKernel(source.get(), destination.get());
-  if (CopyRest(source.get(), destination.get()) != 0) throw TZEPException(kZEPStatusFileSystemError);
-}
-
-int TOSSpecific::DirCopy(std::string from, std::string to, bool recursive) {
-  from = WithTrailingSeparator(from);
-  to = WithTrailingSeparator(to);
-  TUniqueDir dir = OpenDirOrThrow(from);
-  if (!DirExists(to)) CreateDir(to);
-  while (dirent const* const entry = ::readdir(dir.get()))
-    if (!IsDotOrDotDot(entry->d_name)) CopyEntry(from + entry->d_name, to + entry->d_name, recursive);
-  return ::closedir(dir.release());
-}
-
 std::vector<std::string> TOSSpecific::ListDir(std::string path) {
   TUniqueDir const dir = OpenDirOrThrow(path);
   std::vector<std::string> names;
@@ -208,64 +131,6 @@ void TOSSpecific::OpenOutputFileStream(std::ofstream& stream, std::string path) 
     LogErrorAndThrow(code, "TOSSpecific::OpenOutputFileStream --  ", "Failed to open output file: " + path);
   }
   LogDebug("TOSSpecific::OpenOutputFileStream -- Exting ");
-}
-
-std::string TOSSpecific::GetCurrentDir() {
-  char buffer[1024];
-  if (::getcwd(buffer, sizeof buffer) == nullptr) throw TZEPException(kZEPStatusFail);
-  return buffer;
-}
-
-std::string TOSSpecific::GetEnvironment(std::string name) {
-  char const* const value = std::getenv(name.c_str());
-  if (value != nullptr) return value;
-  DebugOut("[ERROR]GetEnvironment:Cannt get environmnet.");
-  return "";
-}
-
-bool TOSSpecific::PutEnvironment(std::string name, std::string value) {
-  if (::setenv(name.c_str(), value.c_str(), 1) == 0) return true;
-  DebugOut("[ERROR]PutEnvironment occured errors.");
-  return false;
-}
-
-std::string TOSSpecific::RelocateRelativePath(std::string base, std::string path) {
-  if (!path.empty() && path.back() == '/') path.pop_back();
-  bool const isAbsolute = !path.empty() && path.front() == '/';
-  if (base.empty() || isAbsolute) return path;
-  return WithTrailingSeparator(base) + path;
-}
-
-bool TOSSpecific::isOEMBuild() { return FileExists("docs/oem_zep_preboot_readme.txt"); }
-
-bool TOSSpecific::removeNonAlpaNumeric(std::string& text) {
-  if (std::size_t const open = text.find('['); open != std::string::npos) text.erase(0, open + 1);
-  if (std::size_t const close = text.find(']'); close != std::string::npos) text.erase(close);
-  return true;
-}
-
-bool TOSSpecific::breakApartVersion(std::string& tail, std::string& head) {
-  std::size_t const first = tail.find('-');
-  if (first == std::string::npos) return true;
-  std::size_t const second = tail.find('-', first + 1);
-  std::size_t const cut = second == std::string::npos ? first : second;
-  head = tail.substr(0, cut);
-  tail.erase(0, cut + 1);
-  return true;
-}
-
-std::vector<std::string> TOSSpecific::multiStringTok(char* buffer, unsigned long length, char separator) {
-  std::vector<std::string> strings;
-  if (length < 2) return strings;
-  // A string that ends at this mark or behind it is not taken, so nothing from the mark on is looked at.
-  char const* const endMark = buffer + length - 2;
-  char const* start = buffer;
-  strings.reserve(8);  // more than most sets have
-  for (char const* end = std::find(start, endMark, separator); end != endMark; end = std::find(start, endMark, '\0')) {
-    strings.emplace_back(start, end);
-    start = end + 1;
-  }
-  return strings;
 }
 
 }  // namespace NQRVZEP20

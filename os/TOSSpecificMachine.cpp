@@ -1,18 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TOSSpecific.h"
 
-#include "TLogger.h"
 #include "TZEPStatusCode.h"
-#include "core/Handles.h"
 #include "core/Log.h"
-#include "loaders/IpmiLibrary.h"
 #include "loaders/SmbiosLibrary.h"
-#include "os/LocalTime.h"
 #include "os/MachineIdentity.h"
 
-#include <algorithm>
-#include <array>
-#include <cstdio>
 #include <memory>
 #include <new>
 #include <optional>
@@ -183,64 +176,6 @@ std::string LowerCase(std::string text) {
   return text;
 }
 
-// ---- Remote identity: FRU data that a controller hands out ----
-
-constexpr unsigned char kStorage = 0x0A;
-constexpr unsigned char kReadFruData = 0x11;
-constexpr unsigned char kFruDevice = 0x00;
-constexpr unsigned char kBytesAsked = 0x1E;
-constexpr unsigned kTypeAndModelOffset = 0x01AC;
-constexpr unsigned kSerialNumberOffset = 0x01CC;
-
-// Asks the controller for FRU data. The session stays open. Kept.
-std::optional<TIpmiResponse> ReadFruData(unsigned offset) {
-  auto const low = static_cast<unsigned char>(offset & 0xFF);
-  auto const high = static_cast<unsigned char>(offset >> 8);
-  TIpmiResponse response;
-  TIpmiResult const result = SendIpmiCommand({kStorage, kReadFruData, {kFruDevice, low, high, kBytesAsked}}, response);
-  return result ? std::optional(response) : std::nullopt;
-}
-
-// The response as text: byte 0 is the count, the data follow.
-std::string_view TextOf(TIpmiResponse const& response) { return reinterpret_cast<char const*>(response.data()); }
-
-// `count` characters of the response from `place` on, also when the answer is shorter and zeros stand there.
-std::string CharactersOf(TIpmiResponse const& response, std::size_t place, std::size_t count) {
-  return std::string(reinterpret_cast<char const*>(response.data()) + place, count);
-}
-
-struct TAccess {
-  std::string const &host, &user, &password;
-};
-
-// Reads from `offset` of the FRU data of a controller what `fieldOf` takes out of the response.
-template <class TField>
-std::string ReadRemote(std::string_view operation, TAccess const& access, unsigned offset, TField fieldOf) {
-  if (!OpenIpmiConnection(access.host, access.user, access.password)) return "";
-  std::optional<TIpmiResponse> const response = ReadFruData(offset);
-  if (!response) return "N/A";
-  LogDebug("SendIpmiCommand successfully. \nrspBuffer for ", operation, ":");
-  LogDebug(TextOf(*response));
-  return fieldOf(*response);
-}
-
-// ---- The file of a debug session ----
-
-constexpr std::size_t kPathSize = 256;  // with the zero byte
-
-// What `path` or the collector's variant says, the machine type and the local time. What does not fit is cut off.
-std::array<char, kPathSize> DebugFilePath(char const* path) {
-  std::string const start = path != nullptr             ? path
-                            : TOSSpecific::isOEMBuild() ? "/var/log/OEM_Support/zep_"
-                                                        : "/var/log/QRV_Support/zep_";
-  std::string const type = TOSSpecific::GetMachineType();
-  std::tm const now = TLocalClock().Now().fFields;
-  std::array<char, kPathSize> whole{};
-  std::snprintf(whole.data(), whole.size(), "%s%s%04d%02d%02d-%02d%02d%02d.log", start.c_str(), type.c_str(), now.tm_year + 1900,
-                now.tm_mon + 1, now.tm_mday, now.tm_hour, now.tm_min, now.tm_sec);
-  return whole;
-}
-
 }  // namespace
 
 std::string TOSSpecific::GetMachineInfo(std::string key) {
@@ -308,30 +243,6 @@ int TOSSpecific::getBIDString(char* stringSet, char* output, int length, int num
     rest.remove_prefix(end + 1);
   }
   return 0;
-}
-
-std::string TOSSpecific::GetRemoteMSN(std::string host, std::string user, std::string password) {
-  return ReadRemote("GetRemoteMSN", {host, user, password}, kSerialNumberOffset,
-                    [](TIpmiResponse const& response) { return CharactersOf(response, 1, 7); });
-}
-
-std::string TOSSpecific::GetRemoteMT(std::string host, std::string user, std::string password) {
-  return ReadRemote("GetRemoteMT", {host, user, password}, kTypeAndModelOffset,
-                    [](TIpmiResponse const& response) { return CharactersOf(response, 1, 4); });
-}
-
-std::string TOSSpecific::GetRemoteMachineModel(std::string host, std::string user, std::string password) {
-  return ReadRemote("GetRemoteMachineModel", {host, user, password}, kTypeAndModelOffset, [](TIpmiResponse const& response) {
-    return std::string(reinterpret_cast<char const*>(response.data()) + 5);  // to the first zero byte
-  });
-}
-
-bool TOSSpecific::SetDebugLevel(int level, char* path) {
-  // Marks the start of a debug session. Nothing is written to it, and nobody asks whether it could be made.
-  TUniqueFile const file(std::fopen(DebugFilePath(path).data(), "w"));
-  if (level < ILogger::kLogError || level > ILogger::kLogVerbose) return false;
-  TLogger::SetLogThreshold(static_cast<ILogger::EZEPLogSeverity>(level));
-  return true;
 }
 
 }  // namespace NQRVZEP20

@@ -1,6 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TOSSpecific.h"
-#include "TZEPException.h"
 #include "core/Failure.h"
 #include "core/Handles.h"
 #include "core/Log.h"
@@ -8,18 +7,14 @@
 #include <fcntl.h>
 #include <signal.h>
 #include <sys/select.h>
-#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <algorithm>
-#include <cstdlib>
 #include <string_view>
 
 namespace NQRVZEP20 {
 namespace {
-
-constexpr int kCaptureTimeoutSeconds = 300;
 
 // ---- What is run ----
 
@@ -226,26 +221,6 @@ std::vector<std::string> CutAtBlanks(std::string const& text) {
   return pieces;
 }
 
-// ---- Files ----
-
-constexpr std::size_t kReadSize = 4096;
-constexpr std::size_t kLargeReadSize = 128 * 1024;
-
-// Room for a regular file that is larger than one read; what grows meanwhile or lies about its size is read all the same.
-// Devices and most files of /proc and /sys have no size and are read in small pieces.
-std::size_t MakeRoomFor(int fd, std::string& contents) {
-  constexpr off_t kMostRoom = off_t{1} << 32;
-  struct stat status;
-  if (::fstat(fd, &status) != 0 || !S_ISREG(status.st_mode) || status.st_size <= off_t{kReadSize}) return kReadSize;
-  if (status.st_size <= kMostRoom) contents.reserve(static_cast<std::size_t>(status.st_size));
-  return kLargeReadSize;
-}
-
-void RunInShell(std::string const& command) {
-  // What became of the command is for the user to see.
-  [[maybe_unused]] int const ignored = std::system(command.c_str());
-}
-
 }  // namespace
 
 int TOSSpecific::SpawnProcess(std::string const& path, std::vector<std::string> const& args, std::string const& argv0,
@@ -275,52 +250,6 @@ std::string TOSSpecific::SpawnProcess(std::string commandLine, int timeout) {
   std::string const program = args.front();
   args.erase(args.begin());
   return SpawnProcess(program, args, timeout);
-}
-
-void TOSSpecific::CapFileViaProc(std::string program, std::vector<std::string> args, std::string fileName,
-                                 std::string& contents) {
-  try {
-    SpawnProcess(program, args, kCaptureTimeoutSeconds);
-    contents = CaptureFile(fileName);
-  } catch (std::exception const& failure) {
-    contents.clear();
-    LogError("failed to capture file content due to exception: ", failure.what());
-  }
-}
-
-std::string TOSSpecific::CaptureFile(std::string path) {
-  TUniqueFd const file(::open(path.c_str(), O_RDONLY));
-  if (!file) LogErrorAndThrow(kZEPStatusFileNotFound, "ERROR: CaptureFile ", "failed to open: " + path);
-  return GetFileContents(file.get(), path, true);
-}
-
-std::string TOSSpecific::CaptureFileLoader(std::string path, bool logContents) {
-  TUniqueFd const file(::open(path.c_str(), O_RDONLY));
-  if (!file) {
-    LogDebug("CaptureFile failed to open: ", path);
-    LogDebug("Please confirm that the related software/driver is properly installed.");
-    return "";
-  }
-  return GetFileContents(file.get(), path, logContents);
-}
-
-std::string TOSSpecific::GetFileContents(int fd, std::string path, bool logContents) {
-  std::string contents;
-  std::vector<char> buffer(MakeRoomFor(fd, contents));
-  ssize_t got;
-  while ((got = ::read(fd, buffer.data(), buffer.size())) > 0) contents.append(buffer.data(), static_cast<std::size_t>(got));
-  if (got < 0) LogAndThrow(ILogger::kLogStatus, kZEPStatusFileSystemError, "GetFileContents ", "failed to read file " + path);
-  if (logContents) LogDebug("Debug (linux toss): GetFileContents() Returned: ", contents);
-  return contents;
-}
-
-void TOSSpecific::LaunchTextEditor(std::string path) {
-  char buffer[4096];
-  bool const hasDirectory = ::getcwd(buffer, sizeof buffer) != nullptr;
-  RunInShell("cp " + path + " " + (hasDirectory ? buffer : "/"));
-  // A path of less than 35 characters throws here, after the copy. Kept.
-  std::string const name = path.substr(path.size() - 35);
-  RunInShell((hasDirectory ? "vi *" : "vi /*") + name + "*");
 }
 
 }  // namespace NQRVZEP20

@@ -101,6 +101,63 @@ TEST(HouseTest, RoomsIncludeOnlyTheRoomsTheyMay) {
   EXPECT_GT(checked, 100);
 }
 
+// ---- Tests and their sources ----
+
+struct TTestWithoutSource {
+  char const *path, *reason;
+};
+
+TTestWithoutSource const kTestsWithoutSource[] = {
+    {"cim/model/CopyMutexTest.cpp", "includes a single public header, as a caller of the mutex does"},
+    {"cim/model/InterfaceBodiesTest.cpp", "all interfaces: the operations that a plug-in may leave out"},
+    {"cim/model/InterfaceSlotsTest.cpp", "all interfaces: the order of their virtual operations"},
+    {"cim/model/InterfaceTableTest.cpp", "all interfaces: the table in docs/writing-a-provider.md"},
+    {"cim/value/TCIMTypeTest.cpp", "TCIMType is declared in TCIMValue.h"},
+    {"cim/value/TCIMValueTextTest.cpp", "the part of TCIMValue that reads text"},
+    {"ipmi/ChkResponseTest.cpp", "the part of IIPMILan that needs no library"},
+    {"os/HostFaultsTest.cpp", "all of os: calls of the C library that fail"},
+    {"providers/memory/ManyElementsTest.cpp", "the complete room, with large namespaces"},
+    {"providers/memory/NamespaceCopyTest.cpp", "the complete room, through the interfaces alone"},
+    {"providers/mof/DeepInheritanceTest.cpp", "the complete room, with large texts"},
+    {"providers/mof/DmtfSchemaTest.cpp", "the complete room, with a real schema"},
+    {"proxy/DhcpParserTest.cpp", "the part of AutoProxyDiscovery that needs no network"},
+    {"tools/zep/commands/ArgumentsTest.cpp", "every command of zep: its arguments"},
+    {"tools/zep/commands/EnvelopeTest.cpp", "every command of zep: its exit status and document"},
+};
+
+char const* ReasonForNoSource(fs::path const& test) {
+  for (TTestWithoutSource const& known : kTestsWithoutSource)
+    if (test == known.path) return known.reason;
+  return nullptr;
+}
+
+// Whether the test, given relative to tests/, has a source or a header of its name: in the same folder of the source tree, or
+// among the public headers. "ShowTest" may also be the test of "ShowCommand".
+bool HasSource(fs::path const& test) {
+  std::string const stem = test.stem().string();
+  std::string const name = stem.substr(0, stem.size() - std::string("Test").size());
+  for (fs::path const& folder : {test.parent_path(), fs::path("include")})
+    for (char const* ending : {".cpp", ".h", "Command.cpp"})
+      if (fs::exists(kSource / folder / (name + ending))) return true;
+  return false;
+}
+
+TEST(HouseTest, EveryTestOfARoomHasASourceOfItsName) {
+  int checked = 0;
+  for (TRoom const& room : kRooms)
+    for (fs::path const& path : SourcesOf("tests/" + std::string(room.folder))) {
+      fs::path const test = fs::relative(path, kSource / "tests");
+      std::string const name = test.filename().string();
+      bool const isTest = name.size() > 8 && name.compare(name.size() - 8, 8, "Test.cpp") == 0;
+      if (!isTest || RoomOf(test.parent_path()) != room.folder) continue;
+      EXPECT_NE(HasSource(test), ReasonForNoSource(test) != nullptr) << test;
+      ++checked;
+    }
+  EXPECT_GT(checked, 80);
+  for (TTestWithoutSource const& known : kTestsWithoutSource)
+    EXPECT_TRUE(fs::exists(kSource / "tests" / known.path)) << known.path << ", " << known.reason;
+}
+
 TEST(HouseTest, ZepcoreHeaderIncludesEveryPublicHeader) {
   std::set<std::string> const all = [] {
     auto const names = QuotedIncludesOf(kSource / "include/zepcore.h");

@@ -4,12 +4,14 @@
 // What the tests of the host services share.
 
 #include "TOSSpecific.h"
+#include "core/Handles.h"
 #include "tests/LogOf.h"
 #include "tests/Support.h"
 
 #include <grp.h>
 #include <sched.h>
 #include <sys/mount.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -20,6 +22,33 @@ namespace NQRVZEP20 {
 
 // The path of a program of tests/os/children.
 inline std::string Child(std::string const& name) { return std::string(ZEP_CHILDREN_DIR) + "/" + name; }
+
+// Replaces standard input by a descriptor, and restores it at the end.
+class TStandardInput {
+public:
+  explicit TStandardInput(int fd) : fOld(::dup(0)) { ::dup2(fd, 0); }
+  ~TStandardInput() { ::dup2(fOld.get(), 0); }
+  TStandardInput(TStandardInput const&) = delete;
+  TStandardInput& operator=(TStandardInput const&) = delete;
+
+private:
+  TUniqueFd fOld;
+};
+
+inline mode_t ModeOf(std::string const& path) {
+  struct stat status {};
+  ::stat(path.c_str(), &status);
+  return status.st_mode & 07777;
+}
+
+class TUmask {
+public:
+  explicit TUmask(mode_t mask) : fOld(::umask(mask)) {}
+  ~TUmask() { ::umask(fOld); }
+
+private:
+  mode_t fOld;
+};
 
 // Works in another directory, and in the old one again at the end.
 class TWorkingDirectory {

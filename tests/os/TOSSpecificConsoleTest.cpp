@@ -1,17 +1,23 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TCommUtil.h"
 #include "TOSSpecific.h"
-#include "tests/Support.h"
 #include "tests/os/FakeClock.h"
+#include "tests/os/HostTools.h"
 
+#include <fcntl.h>
+#include <signal.h>
 #include <time.h>
 
 #include <atomic>
+#include <chrono>
 #include <ctime>
 #include <utility>
 
 namespace NQRVZEP20 {
 namespace {
+
+using namespace std::chrono_literals;
+using TClock = std::chrono::steady_clock;
 
 // Like ToUIString.
 std::string TextOf(std::tm const& fields) {
@@ -244,6 +250,134 @@ TEST(HostBasicsTest, NoneOfThemLogs) {
     TLogger::GetInstance()->OutputLogEntry(ILogger::kLogVerbose, "probe");  // the capture does see what is logged
     EXPECT_EQ(log.Entries(), std::vector<std::string>{"[Verbose] probe"});
   });
+}
+
+// ---- USleep ----
+
+TEST(USleepTest, SleepsMilliseconds) {
+  auto const start = TClock::now();
+  EXPECT_EQ(TOSSpecific::USleep(250), 0);
+  auto const slept = TClock::now() - start;
+  EXPECT_GE(slept, 250ms);
+  EXPECT_LT(slept, 10s);
+  EXPECT_EQ(TOSSpecific::USleep(0), 0);
+}
+
+TEST(USleepTest, ASignalEndsItEarly) {
+  struct sigaction action {
+  }, old;
+  action.sa_handler = [](int) {};
+  ::sigaction(SIGUSR1, &action, &old);
+  // The last of these in microseconds is more than 32 bits hold.
+  for (unsigned int const milliseconds : {60000u, 4294968u}) {
+    std::atomic<bool> done{false};
+    auto const start = TClock::now();
+    std::thread interrupter([&done, sleeper = ::pthread_self()] {
+      std::this_thread::sleep_for(200ms);
+      while (!done) {
+        ::pthread_kill(sleeper, SIGUSR1);
+        std::this_thread::sleep_for(20ms);
+      }
+    });
+    EXPECT_EQ(TOSSpecific::USleep(milliseconds), -1);
+    EXPECT_GE(TClock::now() - start, 150ms);
+    done = true;
+    interrupter.join();
+  }
+  ::sigaction(SIGUSR1, &old, nullptr);
+}
+
+// ---- Who and where ----
+
+TEST(IsAdminTest, AsksForTheRealUser) {
+  EXPECT_EQ(TOSSpecific::IsAdmin(), ::getuid() == 0);
+  EXPECT_EQ(InChild([] { return !BecomeUnprivileged()    ? "still root"
+                                : TOSSpecific::IsAdmin() ? "admin"
+                                                         : "no admin"; }),
+            "no admin");
+  NEEDS(::getuid() == 0, "root");
+  EXPECT_EQ(InChild([] { return ::seteuid(65534) != 0    ? "still root"
+                                : TOSSpecific::IsAdmin() ? "admin"
+                                                         : "no admin"; }),
+            "admin");
+}
+
+// The result in a child where the file in /proc holds that text, or does not exist.
+std::string RunningTypeWith(std::function<void()> const& prepare) {
+  return InChild([&] {
+    if (!MountTmpfs("/proc", "")) return std::string("not mounted");
+    prepare();
+    return std::to_string(TOSSpecific::GetRunningTypeOnXen());
+  });
+}
+
+void MakeCapabilities(std::string const& text) {
+  std::filesystem::create_directory("/proc/xen");
+  WriteFile("/proc/xen/capabilities", text);
+}
+
+TEST(GetRunningTypeOnXenTest, TellsHostsAndDomainsApart) {
+  NEEDS(MayMount(), "leave to mount a file system");
+  EXPECT_EQ(RunningTypeWith([] {}), "2");
+  EXPECT_EQ(RunningTypeWith([] { std::filesystem::create_directories("/proc/xen/capabilities"); }), "2");
+  EXPECT_EQ(RunningTypeWith([] { MakeCapabilities("control_d\n"); }), "0");
+  EXPECT_EQ(RunningTypeWith([] { MakeCapabilities("other, control_domain"); }), "0");
+  EXPECT_EQ(RunningTypeWith([] { MakeCapabilities(""); }), "1");
+  EXPECT_EQ(RunningTypeWith([] { MakeCapabilities("control\n"); }), "1");
+  EXPECT_EQ(RunningTypeWith([] {
+              MakeCapabilities("control_d\n");
+              std::filesystem::permissions("/proc/xen/capabilities", std::filesystem::perms::none);
+              BecomeUnprivileged();
+            }),
+            "threw kZEPStatusFileNotFound");
+}
+
+TEST(GetRunningTypeOnXenTest, ReadsNothingWhereThereIsNoXen) {
+  if (std::filesystem::exists("/proc/xen/capabilities")) GTEST_SKIP() << "this machine is a guest of Xen";
+  EXPECT_EQ(LogOf([] { EXPECT_EQ(TOSSpecific::GetRunningTypeOnXen(), 2); }), std::vector<std::string>{});
+}
+
+// ---- The shell, the command line and the flags ----
+
+TEST(LaunchCommandShellTest, RunsTheShellAndReturnsItsStatus) {
+  TTempDir const dir;
+  WriteFile(dir.Path("input"), "echo typed > " + dir.Path("output") + "\nexit 3\n");
+  TUniqueFd const file(::open(dir.Path("input").c_str(), O_RDONLY));
+  TStandardInput const input(file.get());
+  int const status = TOSSpecific::LaunchCommandShell();
+  EXPECT_TRUE(WIFEXITED(status));
+  EXPECT_EQ(WEXITSTATUS(status), 3);
+  EXPECT_EQ(ReadFile(dir.Path("output")), "typed\n");
+}
+
+TEST(ExpandCommandLineWildcardsTest, HandsBothOnUnchanged) {
+  char program[] = "program", pattern[] = "*.h";
+  char* arguments[] = {program, pattern, nullptr};
+  int count = 0;
+  char** expanded = nullptr;
+  TOSSpecific::ExpandCommandLineWildcards(2, arguments, &count, &expanded);
+  EXPECT_EQ(count, 2);
+  EXPECT_EQ(expanded, arguments);
+  EXPECT_STREQ(expanded[1], "*.h");
+  TOSSpecific::ExpandCommandLineWildcards(0, nullptr, &count, &expanded);
+  EXPECT_EQ(count, 0);
+  EXPECT_EQ(expanded, nullptr);
+}
+
+TEST(FlagsTest, AreFalseAtTheStartAndEachForItself) {
+  EXPECT_FALSE(TOSSpecific::getLuz());
+  EXPECT_FALSE(TOSSpecific::isZEPParser());
+  TOSSpecific::setLuz(true);
+  EXPECT_TRUE(TOSSpecific::getLuz());
+  EXPECT_TRUE(isLuz);
+  EXPECT_FALSE(TOSSpecific::isZEPParser());
+  TOSSpecific::setLuz(false);
+  TOSSpecific::setZEPParser(true);
+  EXPECT_FALSE(TOSSpecific::getLuz());
+  EXPECT_TRUE(TOSSpecific::isZEPParser());
+  EXPECT_TRUE(isParser);
+  isParser = false;
+  EXPECT_FALSE(TOSSpecific::isZEPParser());
 }
 
 }  // namespace

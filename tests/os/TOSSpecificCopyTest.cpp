@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Copies, lists, finds, makes and deletes files, and opens streams on them.
+// Copies files and directories.
 
 #include "TOSSpecific.h"
 #include "core/Handles.h"
@@ -20,21 +20,6 @@ namespace fs = std::filesystem;
 using TEntries = std::vector<std::string>;
 using TNames = std::vector<std::string>;
 
-mode_t ModeOf(std::string const& path) {
-  struct stat status {};
-  ::stat(path.c_str(), &status);
-  return status.st_mode & 07777;
-}
-
-class TUmask {
-public:
-  explicit TUmask(mode_t mask) : fOld(::umask(mask)) {}
-  ~TUmask() { ::umask(fOld); }
-
-private:
-  mode_t fOld;
-};
-
 std::string TextOf(std::size_t size) {
   std::string text(size, ' ');
   for (std::size_t i = 0; i < size; ++i) text[i] = static_cast<char>(i * 31 + i / 256);
@@ -42,36 +27,15 @@ std::string TextOf(std::size_t size) {
 }
 
 // A directory that everybody may use, for what a child does as another user.
-class FilesTest : public testing::Test {
+class FileCopyTest : public testing::Test {
 protected:
-  FilesTest() { fs::permissions(fDir.Path(), fs::perms::all); }
+  FileCopyTest() { fs::permissions(fDir.Path(), fs::perms::all); }
   TTempDir fDir;
 };
 
-// ---- GetFileSize ----
-
-TEST_F(FilesTest, SizeIsThatOfTheFile) {
-  WriteFile(fDir.Path("empty"), "");
-  WriteFile(fDir.Path("file"), "12345");
-  fs::create_symlink("file", fDir.Path("link"));
-  TUniqueFd const sparse(::open(fDir.Path("sparse").c_str(), O_WRONLY | O_CREAT, 0600));
-  ASSERT_EQ(::ftruncate(sparse.get(), 5000000000), 0);
-  EXPECT_EQ(TOSSpecific::GetFileSize(fDir.Path("empty")), 0);
-  EXPECT_EQ(TOSSpecific::GetFileSize(fDir.Path("file")), 5);
-  EXPECT_EQ(TOSSpecific::GetFileSize(fDir.Path("link")), 5);
-  EXPECT_EQ(TOSSpecific::GetFileSize(fDir.Path("sparse")), 5000000000);
-  EXPECT_EQ(TOSSpecific::GetFileSize("/dev/null"), 0);
-}
-
-TEST_F(FilesTest, WhatIsNoFileHasNoSize) {
-  fs::create_symlink("nowhere", fDir.Path("dangling"));
-  for (std::string const& path : {fDir.Path("missing"), fDir.Path(), fDir.Path("dangling"), std::string()})
-    EXPECT_STATUS(TOSSpecific::GetFileSize(path), kZEPStatusFileNotFound) << path;
-}
-
 // ---- FileCopy ----
 
-TEST_F(FilesTest, CopyHasTheContentsOfTheSource) {
+TEST_F(FileCopyTest, CopyHasTheContentsOfTheSource) {
   int const before = OpenDescriptors();
   for (std::size_t const size : {0u, 1u, 32767u, 32768u, 32769u, 65536u, 1048575u, 1048576u, 1048577u, 3000000u}) {
     SCOPED_TRACE(size);
@@ -84,7 +48,7 @@ TEST_F(FilesTest, CopyHasTheContentsOfTheSource) {
   EXPECT_EQ(OpenDescriptors(), before);
 }
 
-TEST_F(FilesTest, DestinationIsNotTruncated) {
+TEST_F(FileCopyTest, DestinationIsNotTruncated) {
   WriteFile(fDir.Path("source"), "0123456789");
   WriteFile(fDir.Path("destination"), "abcdefghijklmnopqrst");
   TOSSpecific::FileCopy(fDir.Path("source"), fDir.Path("destination"));
@@ -100,7 +64,7 @@ TEST_F(FilesTest, DestinationIsNotTruncated) {
   EXPECT_EQ(ReadFile(fDir.Path("destination")), TextOf(2000000) + std::string(1000000, 'x'));
 }
 
-TEST_F(FilesTest, NewDestinationHasThePermissionsOfTheSourceLessTheUmask) {
+TEST_F(FileCopyTest, NewDestinationHasThePermissionsOfTheSourceLessTheUmask) {
   struct TRow {
     mode_t source, mask, copy;
   };
@@ -117,7 +81,7 @@ TEST_F(FilesTest, NewDestinationHasThePermissionsOfTheSourceLessTheUmask) {
   }
 }
 
-TEST_F(FilesTest, ExistingDestinationKeepsItsPermissions) {
+TEST_F(FileCopyTest, ExistingDestinationKeepsItsPermissions) {
   WriteFile(fDir.Path("source"), "text");
   WriteFile(fDir.Path("destination"), "");
   ::chmod(fDir.Path("source").c_str(), 0777);
@@ -126,7 +90,7 @@ TEST_F(FilesTest, ExistingDestinationKeepsItsPermissions) {
   EXPECT_EQ(ModeOf(fDir.Path("destination")), 0600u);
 }
 
-TEST_F(FilesTest, CopyFollowsLinksAtBothEnds) {
+TEST_F(FileCopyTest, CopyFollowsLinksAtBothEnds) {
   WriteFile(fDir.Path("source"), "text");
   WriteFile(fDir.Path("destination"), "");
   fs::create_symlink("source", fDir.Path("linkToSource"));
@@ -136,7 +100,7 @@ TEST_F(FilesTest, CopyFollowsLinksAtBothEnds) {
   EXPECT_TRUE(fs::is_symlink(fDir.Path("linkToDestination")));
 }
 
-TEST_F(FilesTest, AFileCopiedOntoItselfStaysAsItWas) {
+TEST_F(FileCopyTest, AFileCopiedOntoItselfStaysAsItWas) {
   for (std::size_t const size : {1000u, 100000u, 2000000u}) {
     WriteFile(fDir.Path("file"), TextOf(size));
     TOSSpecific::FileCopy(fDir.Path("file"), fDir.Path("file"));
@@ -144,7 +108,7 @@ TEST_F(FilesTest, AFileCopiedOntoItselfStaysAsItWas) {
   }
 }
 
-TEST_F(FilesTest, PseudoFilesAndDevicesAreCopied) {
+TEST_F(FileCopyTest, PseudoFilesAndDevicesAreCopied) {
   TOSSpecific::FileCopy("/proc/version", fDir.Path("version"));  // of size 0, it says
   EXPECT_EQ(ReadFile(fDir.Path("version")), ReadFile("/proc/version"));
   WriteFile(fDir.Path("source"), TextOf(2000000));
@@ -163,7 +127,7 @@ TEST_F(FilesTest, PseudoFilesAndDevicesAreCopied) {
   EXPECT_EQ(arrived, TextOf(2000000));
 }
 
-TEST_F(FilesTest, CopyThrowsWhenAnEndCannotBeOpened) {
+TEST_F(FileCopyTest, CopyThrowsWhenAnEndCannotBeOpened) {
   WriteFile(fDir.Path("source"), "text");
   int const before = OpenDescriptors();
   EXPECT_STATUS(TOSSpecific::FileCopy(fDir.Path("missing"), fDir.Path("copy")), kZEPStatusFileSystemError);
@@ -191,7 +155,7 @@ TEST_F(FilesTest, CopyThrowsWhenAnEndCannotBeOpened) {
   EXPECT_EQ(copyUnprivileged("open", "new"), "copied");
 }
 
-TEST_F(FilesTest, CopyToAFullDiskThrowsAndLeavesWhatFitted) {
+TEST_F(FileCopyTest, CopyToAFullDiskThrowsAndLeavesWhatFitted) {
   NEEDS(MayMount(), "leave to mount a file system");
   for (std::size_t const size : {200000u, 2000000u}) {
     SCOPED_TRACE(size);
@@ -211,7 +175,7 @@ TEST_F(FilesTest, CopyToAFullDiskThrowsAndLeavesWhatFitted) {
   }
 }
 
-TEST_F(FilesTest, ALastChunkOfWhichOnlyAPartFittedIsACopy) {
+TEST_F(FileCopyTest, ALastChunkOfWhichOnlyAPartFittedIsACopy) {
   NEEDS(MayMount(), "leave to mount a file system");
   for (std::size_t const room : {std::size_t{192} << 10, std::size_t{2} << 20}) {
     std::size_t const size = room + 5000;  // of its last chunk, 5,000 bytes, 4,096 find room
@@ -228,7 +192,7 @@ TEST_F(FilesTest, ALastChunkOfWhichOnlyAPartFittedIsACopy) {
   }
 }
 
-TEST_F(FilesTest, CopyBeyondTheLargestSizeOfAFileThrowsAndLeavesWhatFitted) {
+TEST_F(FileCopyTest, CopyBeyondTheLargestSizeOfAFileThrowsAndLeavesWhatFitted) {
   for (std::size_t const size : {200000u, 2000000u}) {
     SCOPED_TRACE(size);
     WriteFile(fDir.Path("source"), TextOf(size));
@@ -255,7 +219,7 @@ std::map<std::string, std::string> TreeOf(std::string const& path) {
   return tree;
 }
 
-class DirCopyTest : public FilesTest {
+class DirCopyTest : public FileCopyTest {
 protected:
   DirCopyTest() {
     fs::create_directories(fDir.Path("from/below/deep"));
@@ -355,240 +319,6 @@ TEST_F(DirCopyTest, WhatWasCopiedBeforeAFailureStays) {
   EXPECT_STATUS(TOSSpecific::DirCopy(fDir.Path("one"), fDir.Path("two"), true), kZEPStatusFileSystemError);
   EXPECT_EQ(ReadFile(fDir.Path("two/") + names[0]), names[0]);
   EXPECT_EQ(ReadFile(fDir.Path("two/") + names[1]), names[1]);
-}
-
-// ---- ListDir ----
-
-TEST_F(FilesTest, ListsEveryNameButTheTwoDots) {
-  fs::create_directories(fDir.Path("list/dir"));
-  fs::create_symlink("nowhere", fDir.Path("list/dangling"));
-  for (char const* name : {"file", ".hidden", "...", "two words", "n\new", "\xff"}) WriteFile(fDir.Path("list/") + name, "");
-  EXPECT_THAT(TOSSpecific::ListDir(fDir.Path("list")),
-              testing::UnorderedElementsAre("dir", "dangling", "file", ".hidden", "...", "two words", "n\new", "\xff"));
-  EXPECT_EQ(TOSSpecific::ListDir(fDir.Path("list/dir")), TNames{});
-}
-
-TEST_F(FilesTest, ListIsInTheOrderOfTheSystem) {
-  for (int i = 0; i < 1000; ++i) WriteFile(fDir.Path(std::to_string(i * 7919 % 1000)), "");
-  TNames expected;
-  TUniqueDir const dir(::opendir(fDir.Path().c_str()));
-  while (dirent const* const entry = ::readdir(dir.get()))
-    if (std::string const name = entry->d_name; name != "." && name != "..") expected.push_back(name);
-  EXPECT_EQ(expected.size(), 1000u);
-  EXPECT_EQ(TOSSpecific::ListDir(fDir.Path()), expected);
-}
-
-TEST_F(FilesTest, WhatIsNoDirectoryCannotBeListed) {
-  int const before = OpenDescriptors();
-  WriteFile(fDir.Path("file"), "");
-  for (std::string const& path : {fDir.Path("missing"), fDir.Path("file"), std::string()})
-    EXPECT_STATUS(TOSSpecific::ListDir(path), kZEPStatusFileSystemError) << path;
-  TOSSpecific::ListDir(fDir.Path());
-  EXPECT_EQ(OpenDescriptors(), before);
-}
-
-// ---- FindFile ----
-
-TEST_F(FilesTest, FindFileReturnsTheLinesOfFind) {
-  fs::create_directories(fDir.Path("tree/below"));
-  WriteFile(fDir.Path("tree/below/file"), "");
-  WriteFile(fDir.Path("tree/two words"), "");
-  EXPECT_THAT(TOSSpecific::FindFile(fDir.Path("tree")),
-              testing::UnorderedElementsAre(fDir.Path("tree"), fDir.Path("tree/below"), fDir.Path("tree/below/file"),
-                                            fDir.Path("tree/two words")));
-  EXPECT_EQ(LogOf([&] { TOSSpecific::FindFile(fDir.Path("tree")); }), (TEntries{"[Debug] SpawnProcess: process find"}));
-}
-
-TEST_F(FilesTest, FindFileHandsOnWhatFindPrintsLineByLine) {
-  WriteFile(fDir.Path("find"), "#!/bin/sh\n[ $# = 1 ] && printf \"$1\"\n");
-  fs::permissions(fDir.Path("find"), fs::perms::all);
-  TEnvironmentGuard const path("PATH", (fDir.Path() + ":/usr/bin:/bin").c_str());
-  struct TRow {
-    std::string output;
-    TNames lines;
-  };
-  TRow const rows[] = {
-      {"", {}},
-      {"one", {"one"}},
-      {"one\\n", {"one"}},
-      {"one\\ntwo", {"one", "two"}},
-      {"one\\n\\ntwo\\n", {"one", "", "two"}},
-      {"\\n", {""}},
-      {"a b\\r\\n", {"a b\r"}},
-  };
-  for (TRow const& row : rows) EXPECT_EQ(TOSSpecific::FindFile(row.output), row.lines) << row.output;
-}
-
-TEST_F(FilesTest, FindsComplaintIsALineAsWell) {
-  TNames const lines = TOSSpecific::FindFile(fDir.Path("missing"));
-  ASSERT_EQ(lines.size(), 1u);
-  EXPECT_NE(lines[0].find("No such file or directory"), std::string::npos) << lines[0];
-}
-
-// ---- deleteFile ----
-
-TEST_F(FilesTest, DeleteFileIsAlwaysTrue) {
-  WriteFile(fDir.Path("file"), "");
-  EXPECT_EQ(LogOf([&] { EXPECT_TRUE(TOSSpecific::deleteFile(fDir.Path("file"))); }),
-            (TEntries{"[Debug] Entering TOSSpecific::deleteFile, path=" + fDir.Path("file"),
-                      "[Debug] Exiting TOSSpecific::deleteFile"}));
-  EXPECT_FALSE(fs::exists(fDir.Path("file")));
-  EXPECT_TRUE(TOSSpecific::deleteFile(fDir.Path("file")));  // is gone already
-  testing::internal::CaptureStderr();
-  EXPECT_TRUE(TOSSpecific::deleteFile(fDir.Path()));  // a directory
-  EXPECT_NE(testing::internal::GetCapturedStderr(), "");
-  EXPECT_TRUE(fs::exists(fDir.Path()));
-}
-
-TEST_F(FilesTest, DeleteFileTakesShellPatternsAndQuotesNothing) {
-  for (char const* name : {"a1", "a2", "b1", "two", "words"}) WriteFile(fDir.Path(name), "");
-  TOSSpecific::deleteFile(fDir.Path("a*"));
-  EXPECT_THAT(TOSSpecific::ListDir(fDir.Path()), testing::UnorderedElementsAre("b1", "two", "words"));
-  TWorkingDirectory const directory(fDir.Path());
-  TOSSpecific::deleteFile("two words");
-  EXPECT_THAT(TOSSpecific::ListDir(fDir.Path()), testing::UnorderedElementsAre("b1"));
-  TOSSpecific::deleteFile("none; : > made-by-the-shell");
-  EXPECT_TRUE(fs::exists("made-by-the-shell"));
-}
-
-// ---- createFile ----
-
-TEST_F(FilesTest, CreateFileWritesTheContents) {
-  int const before = OpenDescriptors();
-  std::string const path = fDir.Path("file");
-  for (std::string const& contents :
-       {std::string("a longer text"), std::string("short"), std::string(), std::string("zero\0byte", 9), TextOf(1000000)}) {
-    EXPECT_TRUE(TOSSpecific::createFile(path, contents));
-    EXPECT_EQ(ReadFile(path), contents);
-  }
-  EXPECT_EQ(OpenDescriptors(), before);
-  EXPECT_EQ(LogOf([&] { TOSSpecific::createFile(path, "text"); }),
-            (TEntries{"[Debug] Entering TOSSpecific::createFile, path=" + path, "[Debug] Successfully created file: " + path,
-                      "[Debug] Exiting TOSSpecific::createFile"}));
-}
-
-TEST_F(FilesTest, CreatedFileIsForItsOwnerToWrite) {
-  for (mode_t const mask : {0u, 022u, 077u}) {
-    TUmask const umask(mask);
-    std::string const path = fDir.Path("mask" + std::to_string(mask));
-    TOSSpecific::createFile(path, "");
-    EXPECT_EQ(ModeOf(path), 0644u & ~mask);
-  }
-}
-
-TEST_F(FilesTest, CreateFileThatCannotBeOpenedIsFalseWithTheReasonAtDebug) {
-  WriteFile(fDir.Path("write-only"), "old");  // it is opened for reading as well
-  fs::permissions(fDir.Path("write-only"), static_cast<fs::perms>(0222));
-  EXPECT_EQ(InChild([&] {
-              if (!BecomeUnprivileged()) return std::string("still root");
-              return std::string(TOSSpecific::createFile(fDir.Path("write-only"), "new") ? "created" : "not created");
-            }),
-            "not created");
-  EXPECT_EQ(ReadFile(fDir.Path("write-only")), "old");
-
-  std::string const path = fDir.Path("missing/file");
-  EXPECT_EQ(LogOf([&] { EXPECT_FALSE(TOSSpecific::createFile(path, "text")); }),
-            (TEntries{"[Debug] Entering TOSSpecific::createFile, path=" + path, "[Debug] Unable to create file, errno=2"}));
-  EXPECT_EQ(
-      LogOf([&] { EXPECT_FALSE(TOSSpecific::createFile(fDir.Path(), "text")); }),
-      (TEntries{"[Debug] Entering TOSSpecific::createFile, path=" + fDir.Path(), "[Debug] Unable to create file, errno=21"}));
-}
-
-TEST_F(FilesTest, CreateFileDoesNotAskWhetherTheContentsArrived) {
-  EXPECT_TRUE(TOSSpecific::createFile("/dev/full", "no room for this"));
-  NEEDS(MayMount(), "leave to mount a file system");
-  TTempDir const small;
-  EXPECT_EQ(InChild([&] {
-              if (!MountTmpfs(small.Path(), "size=64k")) return std::string("not mounted");
-              bool const made = TOSSpecific::createFile(small.Path("file"), TextOf(200000));
-              return std::string(made ? "true, " : "false, ") + std::to_string(TOSSpecific::GetFileSize(small.Path("file")));
-            }),
-            "true, 65536");
-}
-
-// ---- OpenOutputFileStream ----
-
-TEST_F(FilesTest, StreamIsOpenedAndTheFileTruncated) {
-  WriteFile(fDir.Path("file"), "old text");
-  std::ofstream stream;
-  EXPECT_EQ(LogOf([&] { TOSSpecific::OpenOutputFileStream(stream, fDir.Path("file")); }),
-            (TEntries{"[Debug] TOSSpecific::OpenOutputFileStream -- Entering ",
-                      "[Debug] TOSSpecific::OpenOutputFileStream -- Exting "}));
-  EXPECT_EQ(ReadFile(fDir.Path("file")), "");
-  stream << "new" << std::flush;
-  EXPECT_EQ(ReadFile(fDir.Path("file")), "new");
-}
-
-TEST_F(FilesTest, StreamThatIsOpenIsClosedFirst) {
-  std::ofstream stream(fDir.Path("first"));
-  stream << "first";
-  stream.setstate(std::ios::failbit | std::ios::eofbit);
-  TOSSpecific::OpenOutputFileStream(stream, fDir.Path("second"));
-  EXPECT_EQ(ReadFile(fDir.Path("first")), "first");
-  EXPECT_TRUE(stream.good());
-  stream << "second" << std::flush;
-  EXPECT_EQ(ReadFile(fDir.Path("second")), "second");
-}
-
-TEST_F(FilesTest, StreamThatFailedBeforeOpensAllTheSame) {
-  std::ofstream stream;
-  EXPECT_STATUS(TOSSpecific::OpenOutputFileStream(stream, fDir.Path("missing/file")), kZEPStatusFileSystemError);
-  EXPECT_TRUE(stream.fail());
-  EXPECT_NO_THROW(TOSSpecific::OpenOutputFileStream(stream, fDir.Path("file")));
-  EXPECT_TRUE(stream.good());
-}
-
-TEST_F(FilesTest, StreamThatCannotBeOpenedThrows) {
-  std::ofstream stream;
-  for (std::string const& path : {fDir.Path("missing/file"), fDir.Path(), std::string()})
-    EXPECT_EQ(LogOf([&] { EXPECT_STATUS(TOSSpecific::OpenOutputFileStream(stream, path), kZEPStatusFileSystemError); }),
-              (TEntries{"[Debug] TOSSpecific::OpenOutputFileStream -- Entering ",
-                        "[Error] TOSSpecific::OpenOutputFileStream --  Failed to open output file: " + path}));
-  WriteFile(fDir.Path("closed"), "");
-  ::chmod(fDir.Path("closed").c_str(), 0444);
-  EXPECT_EQ(InChild([&] {
-              if (!BecomeUnprivileged()) return "still root";
-              std::ofstream other;
-              TOSSpecific::OpenOutputFileStream(other, fDir.Path("closed"));
-              return "opened";
-            }),
-            "threw kZEPStatusAccessDenied");
-}
-
-TEST_F(FilesTest, ReasonOfAStreamThatCannotBeOpenedTravelsWithTheFailure) {
-  std::ofstream stream;
-  std::string const path = fDir.Path("missing/file");
-  EXPECT_EQ(ReasonOf([&] { TOSSpecific::OpenOutputFileStream(stream, path); }), "Failed to open output file: " + path);
-}
-
-TEST_F(FilesTest, StreamThatThrowsByItselfFailsWithTheStatusAndKeepsItsMask) {
-  constexpr std::ios::iostate kMasks[] = {std::ios::failbit, std::ios::badbit, std::ios::failbit | std::ios::badbit,
-                                          std::ios::failbit | std::ios::badbit | std::ios::eofbit};
-  for (std::ios::iostate const mask : kMasks) {
-    SCOPED_TRACE(mask);
-    std::ofstream stream;
-    stream.exceptions(mask);
-    std::string const path = fDir.Path("missing/file");
-    EXPECT_EQ(LogOf([&] { EXPECT_STATUS(TOSSpecific::OpenOutputFileStream(stream, path), kZEPStatusFileSystemError); }),
-              (TEntries{"[Debug] TOSSpecific::OpenOutputFileStream -- Entering ",
-                        "[Error] TOSSpecific::OpenOutputFileStream --  Failed to open output file: " + path}));
-    EXPECT_EQ(stream.exceptions(), mask);
-    EXPECT_EQ(stream.rdstate(), std::ios::failbit);
-
-    TOSSpecific::OpenOutputFileStream(stream, fDir.Path("file"));
-    EXPECT_EQ(stream.exceptions(), mask);
-    EXPECT_TRUE(stream.good());
-  }
-}
-
-TEST_F(FilesTest, StreamThatThrowsByItselfIsClosedFirstWhateverBecomesOfItsOldFile) {
-  std::ofstream stream("/dev/full");
-  stream.exceptions(std::ios::failbit | std::ios::badbit);
-  stream << "never written";  // which closing the file finds out
-  EXPECT_NO_THROW(TOSSpecific::OpenOutputFileStream(stream, fDir.Path("file")));
-  EXPECT_EQ(stream.exceptions(), std::ios::failbit | std::ios::badbit);
-  stream << "new" << std::flush;
-  EXPECT_EQ(ReadFile(fDir.Path("file")), "new");
 }
 
 }  // namespace

@@ -1,7 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TOSSpecific.h"
-#include "tests/Support.h"
+#include "tests/os/HostTools.h"
 
+#include <dirent.h>
+#include <fcntl.h>
+#include <gmock/gmock.h>
 #include <sched.h>
 #include <sys/mount.h>
 #include <sys/socket.h>
@@ -17,6 +20,8 @@ namespace NQRVZEP20 {
 namespace {
 
 namespace fs = std::filesystem;
+using TEntries = std::vector<std::string>;
+using TNames = std::vector<std::string>;
 
 class TOSSpecificFilesTest : public testing::Test {
 protected:
@@ -185,6 +190,268 @@ TEST_F(TOSSpecificFilesTest, OEMBuildIsTheOneWithTheReadmeBelowTheWorkingDirecto
   fs::current_path("docs");
   EXPECT_FALSE(TOSSpecific::isOEMBuild());
   fs::current_path(old);
+}
+
+// A directory that everybody may use, for what a child does as another user.
+class FilesTest : public testing::Test {
+protected:
+  FilesTest() { fs::permissions(fDir.Path(), fs::perms::all); }
+  TTempDir fDir;
+};
+
+// ---- GetFileSize ----
+
+TEST_F(FilesTest, SizeIsThatOfTheFile) {
+  WriteFile(fDir.Path("empty"), "");
+  WriteFile(fDir.Path("file"), "12345");
+  fs::create_symlink("file", fDir.Path("link"));
+  TUniqueFd const sparse(::open(fDir.Path("sparse").c_str(), O_WRONLY | O_CREAT, 0600));
+  ASSERT_EQ(::ftruncate(sparse.get(), 5000000000), 0);
+  EXPECT_EQ(TOSSpecific::GetFileSize(fDir.Path("empty")), 0);
+  EXPECT_EQ(TOSSpecific::GetFileSize(fDir.Path("file")), 5);
+  EXPECT_EQ(TOSSpecific::GetFileSize(fDir.Path("link")), 5);
+  EXPECT_EQ(TOSSpecific::GetFileSize(fDir.Path("sparse")), 5000000000);
+  EXPECT_EQ(TOSSpecific::GetFileSize("/dev/null"), 0);
+}
+
+TEST_F(FilesTest, WhatIsNoFileHasNoSize) {
+  fs::create_symlink("nowhere", fDir.Path("dangling"));
+  for (std::string const& path : {fDir.Path("missing"), fDir.Path(), fDir.Path("dangling"), std::string()})
+    EXPECT_STATUS(TOSSpecific::GetFileSize(path), kZEPStatusFileNotFound) << path;
+}
+
+// ---- ListDir ----
+
+TEST_F(FilesTest, ListsEveryNameButTheTwoDots) {
+  fs::create_directories(fDir.Path("list/dir"));
+  fs::create_symlink("nowhere", fDir.Path("list/dangling"));
+  for (char const* name : {"file", ".hidden", "...", "two words", "n\new", "\xff"}) WriteFile(fDir.Path("list/") + name, "");
+  EXPECT_THAT(TOSSpecific::ListDir(fDir.Path("list")),
+              testing::UnorderedElementsAre("dir", "dangling", "file", ".hidden", "...", "two words", "n\new", "\xff"));
+  EXPECT_EQ(TOSSpecific::ListDir(fDir.Path("list/dir")), TNames{});
+}
+
+TEST_F(FilesTest, ListIsInTheOrderOfTheSystem) {
+  for (int i = 0; i < 1000; ++i) WriteFile(fDir.Path(std::to_string(i * 7919 % 1000)), "");
+  TNames expected;
+  TUniqueDir const dir(::opendir(fDir.Path().c_str()));
+  while (dirent const* const entry = ::readdir(dir.get()))
+    if (std::string const name = entry->d_name; name != "." && name != "..") expected.push_back(name);
+  EXPECT_EQ(expected.size(), 1000u);
+  EXPECT_EQ(TOSSpecific::ListDir(fDir.Path()), expected);
+}
+
+TEST_F(FilesTest, WhatIsNoDirectoryCannotBeListed) {
+  int const before = OpenDescriptors();
+  WriteFile(fDir.Path("file"), "");
+  for (std::string const& path : {fDir.Path("missing"), fDir.Path("file"), std::string()})
+    EXPECT_STATUS(TOSSpecific::ListDir(path), kZEPStatusFileSystemError) << path;
+  TOSSpecific::ListDir(fDir.Path());
+  EXPECT_EQ(OpenDescriptors(), before);
+}
+
+// ---- FindFile ----
+
+TEST_F(FilesTest, FindFileReturnsTheLinesOfFind) {
+  fs::create_directories(fDir.Path("tree/below"));
+  WriteFile(fDir.Path("tree/below/file"), "");
+  WriteFile(fDir.Path("tree/two words"), "");
+  EXPECT_THAT(TOSSpecific::FindFile(fDir.Path("tree")),
+              testing::UnorderedElementsAre(fDir.Path("tree"), fDir.Path("tree/below"), fDir.Path("tree/below/file"),
+                                            fDir.Path("tree/two words")));
+  EXPECT_EQ(LogOf([&] { TOSSpecific::FindFile(fDir.Path("tree")); }), (TEntries{"[Debug] SpawnProcess: process find"}));
+}
+
+TEST_F(FilesTest, FindFileHandsOnWhatFindPrintsLineByLine) {
+  WriteFile(fDir.Path("find"), "#!/bin/sh\n[ $# = 1 ] && printf \"$1\"\n");
+  fs::permissions(fDir.Path("find"), fs::perms::all);
+  TEnvironmentGuard const path("PATH", (fDir.Path() + ":/usr/bin:/bin").c_str());
+  struct TRow {
+    std::string output;
+    TNames lines;
+  };
+  TRow const rows[] = {
+      {"", {}},
+      {"one", {"one"}},
+      {"one\\n", {"one"}},
+      {"one\\ntwo", {"one", "two"}},
+      {"one\\n\\ntwo\\n", {"one", "", "two"}},
+      {"\\n", {""}},
+      {"a b\\r\\n", {"a b\r"}},
+  };
+  for (TRow const& row : rows) EXPECT_EQ(TOSSpecific::FindFile(row.output), row.lines) << row.output;
+}
+
+TEST_F(FilesTest, FindsComplaintIsALineAsWell) {
+  TNames const lines = TOSSpecific::FindFile(fDir.Path("missing"));
+  ASSERT_EQ(lines.size(), 1u);
+  EXPECT_NE(lines[0].find("No such file or directory"), std::string::npos) << lines[0];
+}
+
+// ---- deleteFile ----
+
+TEST_F(FilesTest, DeleteFileIsAlwaysTrue) {
+  WriteFile(fDir.Path("file"), "");
+  EXPECT_EQ(LogOf([&] { EXPECT_TRUE(TOSSpecific::deleteFile(fDir.Path("file"))); }),
+            (TEntries{"[Debug] Entering TOSSpecific::deleteFile, path=" + fDir.Path("file"),
+                      "[Debug] Exiting TOSSpecific::deleteFile"}));
+  EXPECT_FALSE(fs::exists(fDir.Path("file")));
+  EXPECT_TRUE(TOSSpecific::deleteFile(fDir.Path("file")));  // is gone already
+  testing::internal::CaptureStderr();
+  EXPECT_TRUE(TOSSpecific::deleteFile(fDir.Path()));  // a directory
+  EXPECT_NE(testing::internal::GetCapturedStderr(), "");
+  EXPECT_TRUE(fs::exists(fDir.Path()));
+}
+
+TEST_F(FilesTest, DeleteFileTakesShellPatternsAndQuotesNothing) {
+  for (char const* name : {"a1", "a2", "b1", "two", "words"}) WriteFile(fDir.Path(name), "");
+  TOSSpecific::deleteFile(fDir.Path("a*"));
+  EXPECT_THAT(TOSSpecific::ListDir(fDir.Path()), testing::UnorderedElementsAre("b1", "two", "words"));
+  TWorkingDirectory const directory(fDir.Path());
+  TOSSpecific::deleteFile("two words");
+  EXPECT_THAT(TOSSpecific::ListDir(fDir.Path()), testing::UnorderedElementsAre("b1"));
+  TOSSpecific::deleteFile("none; : > made-by-the-shell");
+  EXPECT_TRUE(fs::exists("made-by-the-shell"));
+}
+
+// ---- createFile ----
+
+TEST_F(FilesTest, CreateFileWritesTheContents) {
+  int const before = OpenDescriptors();
+  std::string const path = fDir.Path("file");
+  for (std::string const& contents :
+       {std::string("a longer text"), std::string("short"), std::string(), std::string("zero\0byte", 9), TextOf(1000000)}) {
+    EXPECT_TRUE(TOSSpecific::createFile(path, contents));
+    EXPECT_EQ(ReadFile(path), contents);
+  }
+  EXPECT_EQ(OpenDescriptors(), before);
+  EXPECT_EQ(LogOf([&] { TOSSpecific::createFile(path, "text"); }),
+            (TEntries{"[Debug] Entering TOSSpecific::createFile, path=" + path, "[Debug] Successfully created file: " + path,
+                      "[Debug] Exiting TOSSpecific::createFile"}));
+}
+
+TEST_F(FilesTest, CreatedFileIsForItsOwnerToWrite) {
+  for (mode_t const mask : {0u, 022u, 077u}) {
+    TUmask const umask(mask);
+    std::string const path = fDir.Path("mask" + std::to_string(mask));
+    TOSSpecific::createFile(path, "");
+    EXPECT_EQ(ModeOf(path), 0644u & ~mask);
+  }
+}
+
+TEST_F(FilesTest, CreateFileThatCannotBeOpenedIsFalseWithTheReasonAtDebug) {
+  WriteFile(fDir.Path("write-only"), "old");  // it is opened for reading as well
+  fs::permissions(fDir.Path("write-only"), static_cast<fs::perms>(0222));
+  EXPECT_EQ(InChild([&] {
+              if (!BecomeUnprivileged()) return std::string("still root");
+              return std::string(TOSSpecific::createFile(fDir.Path("write-only"), "new") ? "created" : "not created");
+            }),
+            "not created");
+  EXPECT_EQ(ReadFile(fDir.Path("write-only")), "old");
+
+  std::string const path = fDir.Path("missing/file");
+  EXPECT_EQ(LogOf([&] { EXPECT_FALSE(TOSSpecific::createFile(path, "text")); }),
+            (TEntries{"[Debug] Entering TOSSpecific::createFile, path=" + path, "[Debug] Unable to create file, errno=2"}));
+  EXPECT_EQ(
+      LogOf([&] { EXPECT_FALSE(TOSSpecific::createFile(fDir.Path(), "text")); }),
+      (TEntries{"[Debug] Entering TOSSpecific::createFile, path=" + fDir.Path(), "[Debug] Unable to create file, errno=21"}));
+}
+
+TEST_F(FilesTest, CreateFileDoesNotAskWhetherTheContentsArrived) {
+  EXPECT_TRUE(TOSSpecific::createFile("/dev/full", "no room for this"));
+  NEEDS(MayMount(), "leave to mount a file system");
+  TTempDir const small;
+  EXPECT_EQ(InChild([&] {
+              if (!MountTmpfs(small.Path(), "size=64k")) return std::string("not mounted");
+              bool const made = TOSSpecific::createFile(small.Path("file"), TextOf(200000));
+              return std::string(made ? "true, " : "false, ") + std::to_string(TOSSpecific::GetFileSize(small.Path("file")));
+            }),
+            "true, 65536");
+}
+
+// ---- OpenOutputFileStream ----
+
+TEST_F(FilesTest, StreamIsOpenedAndTheFileTruncated) {
+  WriteFile(fDir.Path("file"), "old text");
+  std::ofstream stream;
+  EXPECT_EQ(LogOf([&] { TOSSpecific::OpenOutputFileStream(stream, fDir.Path("file")); }),
+            (TEntries{"[Debug] TOSSpecific::OpenOutputFileStream -- Entering ",
+                      "[Debug] TOSSpecific::OpenOutputFileStream -- Exting "}));
+  EXPECT_EQ(ReadFile(fDir.Path("file")), "");
+  stream << "new" << std::flush;
+  EXPECT_EQ(ReadFile(fDir.Path("file")), "new");
+}
+
+TEST_F(FilesTest, StreamThatIsOpenIsClosedFirst) {
+  std::ofstream stream(fDir.Path("first"));
+  stream << "first";
+  stream.setstate(std::ios::failbit | std::ios::eofbit);
+  TOSSpecific::OpenOutputFileStream(stream, fDir.Path("second"));
+  EXPECT_EQ(ReadFile(fDir.Path("first")), "first");
+  EXPECT_TRUE(stream.good());
+  stream << "second" << std::flush;
+  EXPECT_EQ(ReadFile(fDir.Path("second")), "second");
+}
+
+TEST_F(FilesTest, StreamThatFailedBeforeOpensAllTheSame) {
+  std::ofstream stream;
+  EXPECT_STATUS(TOSSpecific::OpenOutputFileStream(stream, fDir.Path("missing/file")), kZEPStatusFileSystemError);
+  EXPECT_TRUE(stream.fail());
+  EXPECT_NO_THROW(TOSSpecific::OpenOutputFileStream(stream, fDir.Path("file")));
+  EXPECT_TRUE(stream.good());
+}
+
+TEST_F(FilesTest, StreamThatCannotBeOpenedThrows) {
+  std::ofstream stream;
+  for (std::string const& path : {fDir.Path("missing/file"), fDir.Path(), std::string()})
+    EXPECT_EQ(LogOf([&] { EXPECT_STATUS(TOSSpecific::OpenOutputFileStream(stream, path), kZEPStatusFileSystemError); }),
+              (TEntries{"[Debug] TOSSpecific::OpenOutputFileStream -- Entering ",
+                        "[Error] TOSSpecific::OpenOutputFileStream --  Failed to open output file: " + path}));
+  WriteFile(fDir.Path("closed"), "");
+  ::chmod(fDir.Path("closed").c_str(), 0444);
+  EXPECT_EQ(InChild([&] {
+              if (!BecomeUnprivileged()) return "still root";
+              std::ofstream other;
+              TOSSpecific::OpenOutputFileStream(other, fDir.Path("closed"));
+              return "opened";
+            }),
+            "threw kZEPStatusAccessDenied");
+}
+
+TEST_F(FilesTest, ReasonOfAStreamThatCannotBeOpenedTravelsWithTheFailure) {
+  std::ofstream stream;
+  std::string const path = fDir.Path("missing/file");
+  EXPECT_EQ(ReasonOf([&] { TOSSpecific::OpenOutputFileStream(stream, path); }), "Failed to open output file: " + path);
+}
+
+TEST_F(FilesTest, StreamThatThrowsByItselfFailsWithTheStatusAndKeepsItsMask) {
+  constexpr std::ios::iostate kMasks[] = {std::ios::failbit, std::ios::badbit, std::ios::failbit | std::ios::badbit,
+                                          std::ios::failbit | std::ios::badbit | std::ios::eofbit};
+  for (std::ios::iostate const mask : kMasks) {
+    SCOPED_TRACE(mask);
+    std::ofstream stream;
+    stream.exceptions(mask);
+    std::string const path = fDir.Path("missing/file");
+    EXPECT_EQ(LogOf([&] { EXPECT_STATUS(TOSSpecific::OpenOutputFileStream(stream, path), kZEPStatusFileSystemError); }),
+              (TEntries{"[Debug] TOSSpecific::OpenOutputFileStream -- Entering ",
+                        "[Error] TOSSpecific::OpenOutputFileStream --  Failed to open output file: " + path}));
+    EXPECT_EQ(stream.exceptions(), mask);
+    EXPECT_EQ(stream.rdstate(), std::ios::failbit);
+
+    TOSSpecific::OpenOutputFileStream(stream, fDir.Path("file"));
+    EXPECT_EQ(stream.exceptions(), mask);
+    EXPECT_TRUE(stream.good());
+  }
+}
+
+TEST_F(FilesTest, StreamThatThrowsByItselfIsClosedFirstWhateverBecomesOfItsOldFile) {
+  std::ofstream stream("/dev/full");
+  stream.exceptions(std::ios::failbit | std::ios::badbit);
+  stream << "never written";  // which closing the file finds out
+  EXPECT_NO_THROW(TOSSpecific::OpenOutputFileStream(stream, fDir.Path("file")));
+  EXPECT_EQ(stream.exceptions(), std::ios::failbit | std::ios::badbit);
+  stream << "new" << std::flush;
+  EXPECT_EQ(ReadFile(fDir.Path("file")), "new");
 }
 
 }  // namespace

@@ -2,7 +2,7 @@
 #include "TOSSpecific.h"
 
 #include "TLogger.h"
-#include "tests/Support.h"
+#include "tests/SmbiosTables.h"
 #include "tests/os/FakeClock.h"
 
 #include <gmock/gmock.h>
@@ -171,6 +171,131 @@ TEST_F(TOSSpecificLogTest, OutputLogStringPrintsNothing) {
   EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
   EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
   EXPECT_THAT(gCalls, IsEmpty());
+}
+
+// ---- SetDebugLevel ----
+
+class SetDebugLevelTest : public testing::Test {
+protected:
+  SetDebugLevelTest() : fDirectory(std::filesystem::current_path()) { std::filesystem::current_path(fDir.Path()); }
+  ~SetDebugLevelTest() override {
+    std::filesystem::current_path(fDirectory);
+    TLogger::SetLogThreshold(ILogger::kLogStatus);
+  }
+
+  void UseTable(std::string const& table) {
+    WriteFile(fDir.Path("table"), table);
+    ::setenv("ZEP_SMBIOS_TABLE", fDir.Path("table").c_str(), 1);
+  }
+
+  bool SetDebugLevel(int level, std::string path) { return TOSSpecific::SetDebugLevel(level, path.data()); }
+
+  static ILogger::EZEPLogSeverity Threshold() { return TLogger::GetInstance()->GetLogThreshold(); }
+
+  TTempDir fDir;
+  std::filesystem::path const fDirectory;
+  TEnvironmentGuard const fTable{"ZEP_SMBIOS_TABLE", "/nonexistent"}, fZone{"TZ", "UTC0"};
+};
+
+std::vector<TFakeClock::TTime> const k3March2024 = {{2024, 3, 3, 9, 5, 7}};
+
+TEST_F(SetDebugLevelTest, MakesAFileNamedByTypeAndTime) {
+  TFakeClock const clock(k3March2024);
+  UseTable(RealTable("full"));
+  EXPECT_TRUE(SetDebugLevel(2, fDir.Path("zep_")));
+  EXPECT_TRUE(std::filesystem::exists(fDir.Path("zep_123420240303-090507.log")));
+  EXPECT_EQ(std::filesystem::file_size(fDir.Path("zep_123420240303-090507.log")), 0u);
+}
+
+TEST_F(SetDebugLevelTest, TheTimeIsLocal) {
+  TFakeClock const clock(k3March2024);
+  ::setenv("TZ", "XST+10", 1);
+  SetDebugLevel(2, "zep_");
+  EXPECT_TRUE(std::filesystem::exists("zep_000020240302-230507.log"));
+}
+
+TEST_F(SetDebugLevelTest, AnExistingFileIsTruncated) {
+  TFakeClock const clock(k3March2024);
+  WriteFile("a000020240303-090507.log", "earlier");
+  SetDebugLevel(2, "a");
+  EXPECT_EQ(ReadFile("a000020240303-090507.log"), "");
+}
+
+TEST_F(SetDebugLevelTest, AnEmptyPathLeadsToTheWorkingDirectory) {
+  TFakeClock const clock(k3March2024);
+  SetDebugLevel(2, "");
+  EXPECT_TRUE(std::filesystem::exists("000020240303-090507.log"));
+}
+
+TEST_F(SetDebugLevelTest, OnlyTheLevels0To4AreSet) {
+  struct TRow {
+    int level;
+    bool result;
+  };
+  TRow const rows[] = {{0, true},   {1, true},   {2, true},    {3, true},    {4, true},          {5, false},
+                       {-1, false}, {99, false}, {100, false}, {101, false}, {2147483647, false}};
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.level);
+    TTempDir const dir;
+    TLogger::SetLogThreshold(ILogger::kLogMemoryOnly);
+    EXPECT_EQ(SetDebugLevel(row.level, dir.Path("x")), row.result);
+    EXPECT_EQ(Threshold(), row.result ? row.level : static_cast<int>(ILogger::kLogMemoryOnly));
+    EXPECT_FALSE(std::filesystem::is_empty(dir.Path())) << "the file is made whatever the level is";
+  }
+}
+
+TEST_F(SetDebugLevelTest, AFileThatCannotBeMadeGoesUnnoticed) {
+  EXPECT_TRUE(SetDebugLevel(1, fDir.Path("absent/zep_")));
+  EXPECT_EQ(Threshold(), ILogger::kLogWarning);
+  EXPECT_FALSE(SetDebugLevel(7, fDir.Path("absent/zep_")));
+}
+
+TEST_F(SetDebugLevelTest, ThePathIsCutOffAfter255Bytes) {
+  TFakeClock const clock(k3March2024);
+  std::string const room = fDir.Path("");  // with its separator
+  SetDebugLevel(2, room + std::string(255 - room.size(), 'x') + "yyy");
+  EXPECT_TRUE(std::filesystem::exists(room + std::string(255 - room.size(), 'x')));
+  SetDebugLevel(2, room + std::string(250 - room.size(), 'z'));
+  EXPECT_TRUE(std::filesystem::exists(room + std::string(250 - room.size(), 'z') + "00002"));
+  std::string long_(100000, 'l');
+  EXPECT_TRUE(SetDebugLevel(2, long_)) << "such a name cannot be made";
+}
+
+TEST_F(SetDebugLevelTest, ReadsTheMachineTypeBeforeTheThresholdChanges) {
+  UseTable(RealTable("full"));
+  EXPECT_THAT(LogOf([&] { SetDebugLevel(0, fDir.Path("zep_")); }),
+              ElementsAre("[Debug] getMachineType() entered.", "[Debug] Machine type detected: 1234",
+                          "[Debug] getMachineType() completed."));
+}
+
+TEST_F(SetDebugLevelTest, APathThatIsGivenCountsInBothVariants) {
+  TFakeClock const clock(k3March2024);
+  std::filesystem::create_directory("docs");
+  WriteFile("docs/oem_zep_preboot_readme.txt", "");
+  EXPECT_TRUE(SetDebugLevel(2, fDir.Path("zep_")));
+  EXPECT_TRUE(std::filesystem::exists(fDir.Path("zep_000020240303-090507.log")));
+}
+
+// Without a path the file lies in a directory of the system. Tests do not write there: they look at a tree of their own.
+TEST_F(SetDebugLevelTest, WithoutAPathTheVariantNamesTheDirectory) {
+  NEEDS(::geteuid() == 0, "root, for a mount namespace");
+  for (bool isOEM : {false, true}) {
+    SCOPED_TRACE(isOEM);
+    std::string const program = fDir.Path("in-namespace");
+    std::string const made = fDir.Path(isOEM ? "made-oem" : "made");
+    if (isOEM) {
+      std::filesystem::create_directory("docs");
+      WriteFile("docs/oem_zep_preboot_readme.txt", "");
+    }
+    WriteFile(program, "mount -t tmpfs none /var/log && mkdir /var/log/QRV_Support /var/log/OEM_Support && " ZEP_DEBUG_SESSION
+                       " && ls /var/log/QRV_Support /var/log/OEM_Support > " +
+                           made);
+    ASSERT_EQ(std::system(("unshare --mount sh " + program).c_str()), 0);
+    std::string const listed = ReadFile(made);
+    std::string const heading = isOEM ? "/var/log/OEM_Support:\n" : "/var/log/QRV_Support:\n";
+    EXPECT_THAT(listed, testing::HasSubstr(heading + "zep_0000"));
+    EXPECT_THAT(listed, testing::ContainsRegex("zep_0000[0-9]{8}-[0-9]{6}\\.log\n"));
+  }
 }
 
 }  // namespace
