@@ -12,7 +12,7 @@
 
 namespace NQRVZEP20 {
 
-// The functions of libcurl that every transfer uses. It is loaded, never linked: the first libcurl that can be had, in the
+// The functions of libcurl that every transfer uses. libcurl is loaded, never linked: the first one that can be loaded, from the
 // directory of the core library or by the linker's search.
 struct TCurlFunctions {
   decltype(curl_global_init)* fGlobalInit = nullptr;
@@ -35,7 +35,7 @@ struct TCurlMessages {
 };
 
 // One transfer by libcurl, which is loaded for it and unloaded with it: the handle is cleaned up, then libcurl itself, then
-// the library is closed. Of libcurl's global state there is one per process: no two of these at once.
+// the library is closed. libcurl's global state belongs to the process: do not use two of these objects at once.
 class TCurl {
 public:
   // Loads libcurl and sets the error buffer. A failure is logged as an error and throws TZEPFailure with

@@ -16,7 +16,7 @@ class TKeptLibrary {
 public:
   using TLibrary = TLoadedLibrary<TFunctions>;
 
-  // Never null: if the library cannot be opened, the outcome tells why.
+  // Never null: if the library cannot be opened, the outcome contains the reason.
   static std::shared_ptr<TLibrary const> Get() {
     static TNeverDestroyed<TKeptLibrary> kept;
     std::lock_guard<std::mutex> const lock(kept->fMutex);

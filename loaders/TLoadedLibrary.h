@@ -60,8 +60,8 @@ EZEPStatusCode StatusOf(TLoadOutcome const& outcome);
 
 // A library opened at run time, and its functions. The library is closed with the object.
 //
-// TFunctions holds a pointer to each function. Its member Place() tells where the library is, and its member Table() returns
-// one row for each pointer:
+// TFunctions holds a pointer to each function. Its member Place() returns where the library is, and its member Table()
+// returns one row for each pointer:
 //
 //   struct TClockFunctions {
 //     decltype(ReadClock)* fRead = nullptr;

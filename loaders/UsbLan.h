@@ -3,7 +3,7 @@
 
 namespace NQRVZEP20 {
 
-// Brings up the USB-LAN of every node through ./ovdusblan.so. IIPMILan::bringupOvdLan documents the result.
+// Brings up the USB-LAN of each node through ./ovdusblan.so. IIPMILan::bringupOvdLan documents the result.
 bool BringUpUsbLan();
 
 }  // namespace NQRVZEP20

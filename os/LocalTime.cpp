@@ -8,7 +8,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-// Standard time's offset, plus 60 while daylight saving is in force, also where the zone shifts by another amount.
+// The offset of standard time, plus 60 while daylight saving is in force, even in a zone that shifts by another amount.
 short UTCOffsetOf(std::tm const& fields) {
   if (fields.tm_isdst <= 0) return static_cast<short>(fields.tm_gmtoff / 60);
   return static_cast<short>(-::timezone / 60 + 60);
@@ -16,8 +16,8 @@ short UTCOffsetOf(std::tm const& fields) {
 
 }  // namespace
 
-// What the thread broke down last. The logger reads the time several times a line, and to break a second down goes to the
-// file system. Without a destructor, so that it serves a thread to its very end.
+// The last second that the thread converted. The logger reads the time several times a line, and each conversion accesses the
+// file system. It has no destructor, so that a thread can use it until its very end.
 struct TLocalClock::TCache {
   TTimeZone fZone;
   bool fHoldsTime = false;

@@ -13,12 +13,12 @@ struct TLocalTime {
   short fUTCOffset;            // minutes east of UTC: the zone's standard offset, plus 60 while daylight saving is in force
 };
 
-// Reads the wall clock. It looks at TZ when it is made: make one, take the readings that belong together, and let it go.
+// Reads the wall clock. TZ is read on construction: make one, take the readings that belong together, and discard it.
 class TLocalClock {
 public:
   TLocalClock();
 
-  // Valid to the next reading on this thread.
+  // Valid until the next reading on this thread.
   TLocalTime const& Now();
 
 private:

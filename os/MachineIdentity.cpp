@@ -13,13 +13,13 @@ unsigned char ByteAt(std::string_view bytes, std::size_t offset) { return static
 
 std::vector<std::string> SplitStringSet(std::string_view set) {
   std::string spared(set);
-  spared.push_back('\0');  // multiStringTok takes the last string only with a byte to spare behind the set
+  spared.push_back('\0');  // multiStringTok needs one more byte after the set to return the last string
   std::vector<std::string> strings = TOSSpecific::multiStringTok(spared.data(), spared.size(), '\0');
-  strings.erase(std::find(strings.begin(), strings.end(), ""), strings.end());  // an empty one closes the set
+  strings.erase(std::find(strings.begin(), strings.end(), ""), strings.end());  // an empty string ends the set
   return strings;
 }
 
-// Assigns the `count` characters from `start` on, when there are as many.
+// Assigns the `count` characters from `start` on, if there are that many.
 void AssignWhole(std::string& field, std::string_view text, std::size_t start, std::size_t count) {
   if (start + count <= text.size()) field = text.substr(start, count);
 }

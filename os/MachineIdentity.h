@@ -8,7 +8,7 @@
 
 namespace NQRVZEP20 {
 
-// What SMBIOS type 1 tells of a machine. Every field begins as what is given when it cannot be read.
+// The identity of a machine, from SMBIOS type 1. Each field starts as the text that stands for an unreadable one.
 struct TMachineIdentity {
   std::string type = "0000";
   std::string name = "Unknown";
@@ -30,16 +30,16 @@ private:
   std::vector<std::string> fStrings;
 };
 
-// Takes type, name and model out of a product description, "Server Q100 -[1234AB7]-" or a bare "1234AB7". It is cut at
-// its first "-", wherever that stands: the name is all in front of it (with the blank), the type the 4 characters from 2
-// behind it on, the model the 3 behind these. A type or model that is not there in full stays as it was, and so does
-// everything of a description in neither form.
+// Reads type, name and model from a product description, "Server Q100 -[1234AB7]-" or a bare "1234AB7". The description is
+// split at its first "-", wherever that is: the name is the text before it (with the blank), the type the 4 characters that
+// start 2 after it, the model the next 3. An incomplete type or model does not change the field, and a description in neither
+// form changes nothing.
 void ReadProductDescription(std::string_view description, TMachineIdentity& identity);
 
-// A BIOS version out of its brackets and up to its build: "-[ABC123-1.10]-" gives "ABC123".
+// The BIOS version without its brackets, up to the build: "-[ABC123-1.10]-" gives "ABC123".
 std::string CleanBiosVersion(std::string version);
 
-// The machine type of the first row of kMachineTypeTable whose prefix is anywhere in the build number.
+// The machine type in the first row of kMachineTypeTable whose prefix occurs anywhere in the build number.
 std::optional<std::string> MachineTypeOfBuild(std::string_view buildNumber);
 
 }  // namespace NQRVZEP20

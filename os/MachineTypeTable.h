@@ -5,7 +5,7 @@
 
 namespace NQRVZEP20 {
 
-// The families of servers by the prefix of their BIOS builds. Searched in this order.
+// The server families by the prefix of their BIOS builds. The table is searched in this order.
 struct TMachineTypeRow {
   std::string_view buildPrefix;  // two characters, lower case
   std::string_view machineType;  // four digits

@@ -8,7 +8,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-// Takes the first line off the text.
+// Removes the first line from the text and returns it.
 std::string_view TakeLine(std::string_view& text) {
   std::size_t const end = text.find('\n');
   std::string_view const line = text.substr(0, end);
@@ -18,7 +18,7 @@ std::string_view TakeLine(std::string_view& text) {
 
 bool Holds(std::string_view line, std::string_view part) { return line.find(part) != line.npos; }
 
-// The number after `label` and blanks: 3 of "Dev#=  3".
+// The number after `label` and blanks: 3 in "Dev#=  3".
 std::optional<int> NumberAfter(std::string_view line, std::string_view label) {
   std::size_t const at = line.find(label);
   if (at == line.npos) return std::nullopt;

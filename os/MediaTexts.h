@@ -8,7 +8,7 @@
 
 namespace NQRVZEP20 {
 
-// Reads what other programs and the kernel print about devices.
+// Parsers of the texts that other programs and the kernel write about devices.
 
 constexpr char kKeyMountPoint[] = "/mnt/key";
 constexpr char kFloppyMountPoint[] = "/mnt/floppy";
@@ -20,8 +20,8 @@ std::string MountPointOf(std::string const& device);
 // The text without blanks, tabs and carriage returns at either end.
 std::string Trimmed(std::string_view text);
 
-// The device files in hwinfo's output of those devices whose block has a line that contains `header` and, after it, one that
-// contains `marker`; each as hwinfo prints it, "/dev/sdc (/dev/sg3)".
+// The device files in hwinfo's output for each device whose block has a line that contains `header` and, after it, a line that
+// contains `marker`. Each is returned as hwinfo prints it: "/dev/sdc (/dev/sg3)".
 std::vector<std::string> DeviceFilesIn(std::string_view hwinfoOutput, std::string_view header, std::string_view marker);
 
 // "/dev/sdc (/dev/sg3)" becomes "/dev/sdc".
@@ -43,7 +43,7 @@ struct TUsbDevice {
   int fBus, fDevice;
 };
 
-// Whether the kernel's list of USB devices holds it.
+// Whether the kernel's list of USB devices contains the device.
 bool Lists(std::string_view usbDevices, TUsbDevice const& device);
 
 }  // namespace NQRVZEP20

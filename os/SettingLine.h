@@ -13,8 +13,8 @@ struct TSettingLine {
   bool IsSetting() const { return !fIsComment && !fKey.empty() && !fValue.empty(); }
 };
 
-// The first "=" of the line separates key and value. Without "=" the value starts where the line does: a bare word maps to
-// itself. Kept.
+// The first "=" of the line separates key and value. Without "=" the value starts at the start of the line: a bare word is its
+// own value. Kept.
 inline TSettingLine ReadSettingLine(std::string_view line) {
   std::size_t const equals = line.find('=');
   return {!line.empty() && line.front() == '#', equals != line.npos, line.substr(0, equals), line.substr(equals + 1)};

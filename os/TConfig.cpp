@@ -16,7 +16,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-// A file that goes away between the two questions is missing as well.
+// A file that disappears between the two checks also counts as missing.
 bool HasContents(std::string const& path) {
   try {
     return TOSSpecific::FileExists(path) && TOSSpecific::GetFileSize(path) != 0;
@@ -25,7 +25,7 @@ bool HasContents(std::string const& path) {
   }
 }
 
-// Every line, with a newline after it, up to the end of the file or to an error, which leaves the stream bad.
+// All lines, each with a newline, up to the end of the file or to an error, which leaves the stream bad.
 std::string LinesOf(std::istream& file) {
   std::string text;
   for (std::string line; std::getline(file, line);) text.append(line) += '\n';
@@ -59,15 +59,15 @@ std::size_t LengthOfCommonStart(std::vector<TSetting> const& settings) {
   return common.size();
 }
 
-// The first eight bytes as a number that orders as they do.
+// The first eight bytes, as a number with the same order.
 std::uint64_t HeadOf(std::string_view text) {
   std::uint64_t head = 0;
   for (std::size_t i = 0; i < 8; ++i) head = head << 8 | (i < text.size() ? static_cast<unsigned char>(text[i]) : 0u);
   return head;
 }
 
-// By key, and those of one key in the order of the file. The eight bytes behind the start that all keys share are compared
-// first, as one number: they nearly always decide, and the texts, which lie far apart, are left alone.
+// Sorts by key, and settings with the same key in the order of the file. The eight bytes after the start that all keys share are
+// compared first, as one number: they nearly always decide, and the texts, which are far apart in memory, need not be read.
 void SortByKey(std::vector<TSetting>& settings) {
   std::size_t const commonLength = LengthOfCommonStart(settings);
   for (TSetting& setting : settings) setting.fHead = HeadOf(setting.fKey.substr(commonLength));
@@ -82,7 +82,7 @@ void SortByKey(std::vector<TSetting>& settings) {
 TConfig* TConfig::cfgInstance = nullptr;
 
 TConfig* TConfig::GetInstance() {
-  if (cfgInstance == nullptr) cfgInstance = std::make_unique<TConfig>().release();  // lives to the end of the process
+  if (cfgInstance == nullptr) cfgInstance = std::make_unique<TConfig>().release();  // lives until the end of the process
   return cfgInstance;
 }
 
@@ -109,14 +109,14 @@ void TConfig::parseConfigFile() {
     return;
   }
   std::string const text = LinesOf(file);
-  if (file.bad()) {  // nothing of a part is used
+  if (file.bad()) {  // a part of the file is not used
     LogError("TConfig::parseConfigFile(): Read config file ", fFileName, " failed");
     return;
   }
   std::vector<TSetting> settings = SettingsOf(text);
-  SortByKey(settings);  // a map takes sorted settings without a search
+  SortByKey(settings);  // a map inserts sorted settings without a search
   for (TSetting const& setting : settings)
-    fSettings.try_emplace(fSettings.end(), std::string(setting.fKey), setting.fValue);  // the first of one key stays
+    fSettings.try_emplace(fSettings.end(), std::string(setting.fKey), setting.fValue);  // the first setting of a key is kept
 }
 
 std::string TConfig::getValue(std::string const& key) {
@@ -135,7 +135,7 @@ std::string TConfig::getValue(std::string const& key) {
 
 std::vector<std::string> TConfig::listKeys() {
   if (fSettings.empty()) {
-    LogError("TConfig::getValue(): map is empty");  // names getValue here too. Kept.
+    LogError("TConfig::getValue(): map is empty");  // names getValue, although this is listKeys. Kept.
     return {};
   }
   std::vector<std::string> keys;

@@ -36,16 +36,16 @@ std::list<ILogger::TLogEntry> TLogger::fLogEntries;
 
 namespace {
 
-// Whether the list and its lock exist. Destructors that run after theirs at the end of the process may still log (those of
-// the registered providers do run then); what they log is not recorded.
+// Whether the list and its lock exist. At the end of the process, destructors that run after theirs may still log (those of the
+// registered providers do); their entries are not recorded.
 std::atomic<bool> gListExists = false;
 struct TListLife {
   TListLife() { gListExists = true; }
   ~TListLife() { gListExists = false; }
 } const gListLife;
 
-// The calling thread's logger, null before its first call and after its end: GetInstance costs one load, and no call to find the
-// place of the variable.
+// The calling thread's logger; null before the first call and after its end. GetInstance costs one load, and no call to find the
+// address of the variable.
 [[gnu::tls_model("initial-exec")]] thread_local TLogger* tInstance = nullptr;
 
 void DeleteInstance(void* instance) {
@@ -57,9 +57,9 @@ void CheckOrThrow(int error) {
   if (error != 0) throw boost::thread_resource_error(error, "TLogger::GetInstance");
 }
 
-// Ends every thread's logger with its thread, after the thread's own objects; and at the end of the process, where it ends
-// itself, that of the last thread. It does what boost::thread_specific_ptr does, without the library which that needs and
-// with which this one takes twice as long to load.
+// Destroys each thread's logger when the thread ends, after the thread's own objects, and the last thread's at the end of the
+// process, when this object is destroyed. boost::thread_specific_ptr does the same, but needs a library that doubles the time to
+// load this one.
 std::atomic<bool> gOwnerExists = true;
 class TOwner {
 public:
@@ -78,8 +78,8 @@ private:
   pthread_key_t fKey;
 };
 
-// A thread that logs once its logger is gone (from what ends still later) gets a new one. At the end of the process nothing
-// is left to own it, and it is never destroyed.
+// A thread that logs after its logger was destroyed (from an object that ends later) gets a new one. At the end of the process
+// nothing owns the new one any more, so it is never destroyed.
 TLogger* MakeInstance() {
   static TOwner owner;
   auto instance = std::make_unique<TLogger>();
@@ -95,7 +95,7 @@ bool IsMemoryOnly(ILogger::EZEPLogSeverity severity) {
   return severity == ILogger::kLogMemoryOnly || severity == ILogger::kLogMemoryOnlyAlways;
 }
 
-// A text of a few pieces and numbers, built without an allocation.
+// A short text of pieces and numbers, built without an allocation.
 class TShortText {
 public:
   TShortText& operator<<(std::string_view piece) {
@@ -113,10 +113,10 @@ private:
   std::size_t fSize = 0;
 };
 
-// "FDR_[Status] 3/3/2024  9:5:7 ", without zero fill. Each field is of a reading of its own: a line that is written across
-// the turn of a second may mix two times. Kept.
+// "FDR_[Status] 3/3/2024  9:5:7 ", without zero fill. Each field is read from the clock separately: a line that is written while
+// the second changes may mix two times. Kept.
 TShortText HeadOf(ILogger::EZEPLogSeverity severity) {
-  TLocalClock clock;  // that of GetLocalTime
+  TLocalClock clock;  // the same as in GetLocalTime
   int const second = clock.Now().fFields.tm_sec;
   int const minute = clock.Now().fFields.tm_min;
   int const hour = clock.Now().fFields.tm_hour;
@@ -142,15 +142,15 @@ void Record(ILogger::EZEPLogSeverity severity, std::string const& message) {
 
 constexpr mode_t kOwnerOnly = S_IRUSR | S_IWUSR;
 
-// A file that is made here is for its owner alone, whatever the umask is: entries at debug severity may hold passwords.
+// A file created here is readable by its owner only, whatever the umask: entries at debug severity may contain passwords.
 TUniqueFd OpenLogFile(std::string const& path, int flags) {
   TUniqueFd made(::open(path.c_str(), flags | O_CREAT | O_EXCL, kOwnerOnly));
   if (!made && errno == EEXIST) return TUniqueFd(::open(path.c_str(), flags | O_CREAT, kOwnerOnly));
-  if (made) ::fchmod(made.get(), kOwnerOnly);  // a file system without such modes refuses, and the log is written all the same
+  if (made) ::fchmod(made.get(), kOwnerOnly);  // a file system without modes refuses this; the log is still written
   return made;
 }
 
-// As std::fopen, with that mode for a new file: null, with the reason in errno, for a failure.
+// Like std::fopen, with that mode for a new file. Returns null, with the reason in errno, on failure.
 std::FILE* OpenLogStream(std::string const& path, bool isAppended) {
   TUniqueFd file = OpenLogFile(path, O_RDWR | (isAppended ? O_APPEND : O_TRUNC));
   std::FILE* const stream = file ? ::fdopen(file.get(), isAppended ? "a+" : "w+") : nullptr;
@@ -206,14 +206,14 @@ void TLogger::ClearLog() {
 TZEPStatusCode TLogger::Initialize(std::string name) {
   if (fInitialized) return kZEPStatusOK;
   TCommUtil::MkDirHier(m_logFileDir);
-  SetLogFilename(m_logFileDir + name + ".log");  // a derived logger's, where it overrides this
+  SetLogFilename(m_logFileDir + name + ".log");  // virtual: a derived logger may override it
   fInitialized = true;
   return kZEPStatusOK;
 }
 
 void TLogger::SetLogFilename(std::string path) {
   fLogFilename = path;
-  // The stream of an earlier call is not closed: it stays open, unused. Kept.
+  // The stream of an earlier call stays open, unused. Kept.
   fLogFile = OpenLogStream(path, std::getenv("QRV_YBNQI_GUI_T") != nullptr);
   if (fLogFile == nullptr) throw TZEPException(errno == EACCES ? kZEPStatusAccessDenied : kZEPStatusFileSystemError);
   WriteFlushed(fLogFile, "-- ZEP Log Opened ----------------------------\n");

@@ -18,8 +18,9 @@ constexpr int kCaptureTimeoutSeconds = 300;
 constexpr std::size_t kReadSize = 4096;
 constexpr std::size_t kLargeReadSize = 128 * 1024;
 
-// Room for a regular file that is larger than one read; what grows meanwhile or lies about its size is read all the same.
-// Devices and most files of /proc and /sys have no size and are read in small pieces.
+// Reserves memory for a regular file that is larger than one read, and returns the size of the reads. A file that grows
+// meanwhile, or reports a wrong size, is read to its end as well. Devices and most files of /proc and /sys report no size and
+// are read in small pieces.
 std::size_t MakeRoomFor(int fd, std::string& contents) {
   constexpr off_t kMostRoom = off_t{1} << 32;
   struct stat status;
@@ -29,7 +30,7 @@ std::size_t MakeRoomFor(int fd, std::string& contents) {
 }
 
 void RunInShell(std::string const& command) {
-  // What became of the command is for the user to see.
+  // The user sees the result of the command; it is not checked.
   [[maybe_unused]] int const ignored = std::system(command.c_str());
 }
 
@@ -76,7 +77,7 @@ void TOSSpecific::LaunchTextEditor(std::string path) {
   char buffer[4096];
   bool const hasDirectory = ::getcwd(buffer, sizeof buffer) != nullptr;
   RunInShell("cp " + path + " " + (hasDirectory ? buffer : "/"));
-  // A path of less than 35 characters throws here, after the copy. Kept.
+  // A path of fewer than 35 characters throws here, after the copy. Kept.
   std::string const name = path.substr(path.size() - 35);
   RunInShell((hasDirectory ? "vi *" : "vi /*") + name + "*");
 }

@@ -22,7 +22,7 @@ TCIMDateTime TOSSpecific::GetLocalTime() {
 }
 
 int TOSSpecific::USleep(unsigned int milliseconds) {
-  constexpr unsigned int kLongest = 4000000;  // what usleep can be told in microseconds
+  constexpr unsigned int kLongest = 4000000;  // in microseconds it still fits the argument of usleep
   for (; milliseconds > kLongest; milliseconds -= kLongest)
     if (int const result = ::usleep(kLongest * 1000); result != 0) return result;
   return ::usleep(milliseconds * 1000);

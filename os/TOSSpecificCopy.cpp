@@ -29,13 +29,13 @@ TUniqueFd OpenOrThrow(std::string const& path, int flags, mode_t mode = 0) {
 constexpr off_t kLargeFile = 1 << 20;
 constexpr std::size_t kChunkSize = 32768;
 
-// Takes a large file through the kernel, which copies faster than a buffer here. How far that gets does not matter: both
-// descriptors are left at the start of a chunk, and CopyRest goes on from there to the end or to the reason of the stop.
+// Copies a large file in the kernel, which is faster than through a buffer. It may stop early: both descriptors are left at the
+// start of a chunk, and CopyRest continues from there to the end of the file or to the failure.
 void CopyInKernel(int from, int to) {
   constexpr std::size_t kAtATime = 1 << 30;
   off_t copied = 0;
   for (ssize_t got; (got = ::copy_file_range(from, nullptr, to, nullptr, kAtATime, 0)) > 0;) copied += got;
-  if (copied == 0) return;  // an end may be a pipe, in which there are no places to go to
+  if (copied == 0) return;  // one of the files may be a pipe, which cannot seek
   off_t const start = copied - copied % static_cast<off_t>(kChunkSize);
   if (::lseek(from, start, SEEK_SET) != start || ::lseek(to, start, SEEK_SET) != start)
     throw TZEPException(kZEPStatusFileSystemError);
@@ -47,7 +47,7 @@ ssize_t CopyRest(int from, int to) {
   for (;;) {
     ssize_t const got = ::read(from, buffer, sizeof buffer);
     if (got <= 0) return got;
-    // What a short write left out is not written again. Kept.
+    // The rest of a short write is not written. Kept.
     ssize_t const put = ::write(to, buffer, static_cast<std::size_t>(got));
     if (put <= 0) return put;
   }
@@ -69,7 +69,7 @@ void CopyEntry(std::string const& from, std::string const& to, bool recursive) {
 void TOSSpecific::FileCopy(std::string from, std::string to) {
   struct stat const status = StatusOrThrow(from);
   TUniqueFd const source = OpenOrThrow(from, O_RDONLY);
-  // Not truncated: behind a shorter source the destination keeps its old tail. Kept.
+  // Not truncated: a destination that is longer than the source keeps its old tail. Kept.
   TUniqueFd const destination = OpenOrThrow(to, O_WRONLY | O_CREAT, status.st_mode);
 
   if (S_ISREG(status.st_mode) && status.st_size >= kLargeFile) CopyInKernel(source.get(), destination.get());

@@ -37,8 +37,8 @@ std::vector<std::string> LinesOf(std::string const& text) {
 
 // ---- Streams ----
 
-// Keeps a stream from throwing by itself while it lives. Afterwards the stream throws for what happens then, not for the state
-// that it is left in.
+// Prevents a stream from throwing while this object lives. Afterwards the stream throws for later failures, but not for the
+// state in which it is left.
 class TStreamHeldBack {
 public:
   explicit TStreamHeldBack(std::ios& stream) : fStream(stream), fMask(stream.exceptions()) {
@@ -47,7 +47,7 @@ public:
   ~TStreamHeldBack() {
     try {
       fStream.exceptions(fMask);
-    } catch (std::ios::failure const&) {  // for that state; the mask is set all the same
+    } catch (std::ios::failure const&) {  // thrown for the current state; the mask is set nevertheless
     }
   }
   TStreamHeldBack(TStreamHeldBack const&) = delete;
@@ -60,7 +60,7 @@ private:
 
 }  // namespace
 
-// The logger itself uses these tests and CreateDir, so they write nothing to the log.
+// The logger itself uses FileExists, DirExists and CreateDir, so they log nothing.
 
 bool TOSSpecific::FileExists(std::string path) {
   struct stat status;
@@ -98,7 +98,7 @@ std::vector<std::string> TOSSpecific::FindFile(std::string name) {
 
 bool TOSSpecific::deleteFile(std::string path) {
   LogDebug("Entering TOSSpecific::deleteFile, path=", path);
-  // Neither quoted nor escaped, so that the path may hold shell patterns. Kept.
+  // Neither quoted nor escaped, so the path may contain shell patterns. Kept.
   [[maybe_unused]] int const ignored = std::system(("rm -f " + path).c_str());
   LogDebug("Exiting TOSSpecific::deleteFile");
   return true;
@@ -112,7 +112,7 @@ bool TOSSpecific::createFile(std::string path, std::string contents) {
     LogDebug("Unable to create file, errno=", error);
     return false;
   }
-  // One write, and nobody asks how much of it arrived. Kept.
+  // One write, whose result is ignored. Kept.
   [[maybe_unused]] ssize_t const ignored = ::write(file.get(), contents.data(), contents.size());
   file.reset();
   LogDebug("Successfully created file: ", path);

@@ -10,8 +10,8 @@
 namespace NQRVZEP20 {
 namespace {
 
-// Hands single keys on as they are typed: all local modes of the terminal on standard input are off, and one key is
-// enough for a read. Its settings come back at the end. Anything but a terminal is left as it is.
+// Makes each key available as soon as it is typed: all local modes of the terminal on standard input are off, and a read returns
+// after one key. The destructor restores the settings. Standard input that is not a terminal is not changed.
 class TSingleKeys {
 public:
   TSingleKeys() : fIsTerminal(::tcgetattr(STDIN_FILENO, &fSettings) == 0) {
@@ -46,7 +46,7 @@ bool TOSSpecific::IsKeyWaiting() {
 
 int TOSSpecific::GetKeyboardChar() {
   TSingleKeys const singleKeys;
-  // Past stdio, which would take more than this one character out of IsKeyWaiting's sight.
+  // Not through stdio, which would buffer more than one character, where IsKeyWaiting cannot see it.
   unsigned char character;
   return ::read(STDIN_FILENO, &character, 1) == 1 ? character : EOF;
 }

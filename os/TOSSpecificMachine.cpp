@@ -20,11 +20,11 @@ constexpr std::size_t kSerialNumber = 7;
 
 constexpr int kBiosInformation = 0;  // SMBIOS type 0
 constexpr std::size_t kBiosVersion = 5;
-constexpr int kBiosStringArea = 100;  // bytes of its string set that are looked at
+constexpr int kBiosStringArea = 100;  // bytes of its string set that are searched
 
 constexpr char const* kNoBiosID = "00";
 
-// Null when there is no memory.
+// Null when there is not enough memory.
 std::unique_ptr<char[]> NewClearedBuffer(int size) {
   return std::unique_ptr<char[]>(new (std::nothrow) char[static_cast<std::size_t>(size)]());
 }
@@ -92,7 +92,7 @@ TMachineIdentity IdentityIn(std::string_view systemInformation, EIdentityLog log
   return identity;
 }
 
-// Reads SMBIOS type 1, for GetMachineType and GetMachineInfo alike: the messages of both name the former.
+// Reads SMBIOS type 1 for GetMachineType and GetMachineInfo. The messages name GetMachineType in both cases.
 TMachineIdentity ReadMachineIdentity(EIdentityLog logged) {
   TSmbiosTables tables(TSmbiosTables::kStaysLoaded);
   if (!AreOpen(tables)) return {};
@@ -104,7 +104,7 @@ TMachineIdentity ReadMachineIdentity(EIdentityLog logged) {
   return identity;
 }
 
-// What the readers of the BIOS version log.
+// The messages of a reader of the BIOS version.
 struct TBiosVersionMessages {
   std::string_view unableToOpen, retrieving, readFailed, noMoreItems;
 };
@@ -123,7 +123,7 @@ constexpr TBiosVersionMessages kGetMachineTypeFromIDMessages = {
     "TOSSpecific::GetMachineTypeFromID - read all smbios structures available for type 0",
 };
 
-// The BIOS version in the structure of type 0 that the buffer holds; empty when it is not in the part looked at.
+// The BIOS version in the structure of type 0 in the buffer; empty when it is not in the part that is searched.
 std::string BiosVersionIn(char* buffer) {
   std::size_t const formattedLength = static_cast<unsigned char>(buffer[1]);
   if (formattedLength <= kBiosVersion) return {};
@@ -132,15 +132,15 @@ std::string BiosVersionIn(char* buffer) {
   return CleanBiosVersion(version);
 }
 
-// Reads the BIOS version of SMBIOS type 0. The tables stay open while it lives, because the callers tell what they made of
-// the version before the tables are closed.
+// Reads the BIOS version of SMBIOS type 0. The tables stay open while this object lives, because the callers log their result
+// before the tables are closed.
 class TBiosVersionReader {
 public:
   explicit TBiosVersionReader(TBiosVersionMessages const& messages) : fMessages(messages) {
     if (fBuffer) fTables.emplace(TSmbiosTables::kStaysLoaded);  // without memory they are not opened
   }
 
-  // The cleaned version, empty when the read failed. Nothing when the tables cannot be opened or hold no such structure.
+  // The cleaned version; empty when the read failed. Nothing when the tables cannot be opened or have no such structure.
   std::optional<std::string> Read() {
     int const openStatus = fTables ? OpenStatusOf(*fTables) : static_cast<int>(kZEPStatusOutOfMemory);
     if (openStatus != kZEPStatusOK) {
@@ -229,7 +229,7 @@ std::string TOSSpecific::GetBiosID() {
 int TOSSpecific::getBIDString(char* stringSet, char* output, int length, int number) {
   if (length < 1) return 0;
   std::string_view rest(stringSet, static_cast<std::size_t>(length));
-  // The empty string that closes the set is none of its strings, nor are zeros behind it.
+  // The empty string that ends the set, and zeros after it, are not strings of the set.
   std::size_t const last = rest.find_last_not_of('\0');
   if (last == rest.npos) return 0;
   rest = rest.substr(0, last + 2);

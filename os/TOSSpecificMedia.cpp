@@ -31,7 +31,7 @@ bool Succeeds(std::string const& command) { return std::system(command.c_str()) 
 constexpr int kProbeTimeoutSeconds = 300;
 constexpr int kCdRom = 1;
 
-// How hwinfo is asked for devices of one kind, and how it marks the virtual ones.
+// The hwinfo query for devices of one kind, and the marks of virtual ones in its output.
 struct TProbe {
   char const* fHeader;
   char const* fMarker;
@@ -45,7 +45,7 @@ constexpr TProbe kProbes[] = {
     {"Hardware Class: mouse", "0x4012", "--mouse"},
 };
 
-// ---- What the namespace knows ----
+// ---- Disks in the namespace ----
 
 // A disk as the namespace describes it.
 struct TDisk {
@@ -55,7 +55,7 @@ struct TDisk {
   std::string Description() const { return fVendor + (fVendor.empty() || fProduct.empty() ? "" : " ") + fProduct; }
 };
 
-// Empty for a property that is NULL or not there.
+// Empty for a property that is NULL or missing.
 std::string ReadText(ICIMInstance const& instance, std::string const& property) {
   auto const found = instance.GetProperty(property, TCIMContext());
   if (!found) return "";
@@ -78,7 +78,7 @@ std::vector<TDisk> ReadDisks(ICIMNamespace const& ns) {
   return disks;
 }
 
-// ---- What the kernel knows ----
+// ---- Disks in the kernel ----
 
 // Empty, with the reason in the log, when the file cannot be read.
 std::string CaptureWherePossible(std::string const& file) {
@@ -89,13 +89,13 @@ std::string CaptureWherePossible(std::string const& file) {
   }
 }
 
-// The kernel's list of USB devices; current kernels have it in the second place.
+// The kernel's list of USB devices. Current kernels have it under the second path.
 std::string ReadUsbDevices() {
   std::string list = CaptureWherePossible("/proc/bus/usb/devices");
   return list.empty() ? CaptureWherePossible("/sys/kernel/debug/usb/devices") : list;
 }
 
-// Asks an open node for an address. The first two requests are for disks, the third is for generic nodes.
+// Queries an open node for its address. The first two requests are for disks, the third is for generic nodes.
 std::optional<TScsiAddress> AskDisk(int fd) {
   struct {
     std::uint32_t fIdLun;  // from the lowest byte: target, lun, channel, host
@@ -113,7 +113,7 @@ std::optional<TScsiAddress> AskGeneric(int fd) {
   return TScsiAddress{id.host_no, id.channel, id.scsi_id, id.lun};
 }
 
-// Why there is no answer is in the log.
+// Returns nothing, with the reason in the log, when there is no answer.
 template <class TAsk>
 std::optional<TScsiAddress> AddressOfNode(std::string const& node, TAsk ask) {
   TUniqueFd const fd(::open(node.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
@@ -142,7 +142,7 @@ std::vector<TNode> AskDiskNodes() {
   return nodes;
 }
 
-// The USB device that sysfs shows above a disk.
+// The USB device above a disk in sysfs.
 std::optional<TUsbDevice> UsbDeviceAbove(TNode const& node) {
   std::error_code error;
   std::filesystem::path place = std::filesystem::canonical("/sys/class/block/" + node.fName + "/device", error);
@@ -154,7 +154,7 @@ std::optional<TUsbDevice> UsbDeviceAbove(TNode const& node) {
   return std::nullopt;
 }
 
-// Where sysfs does not know the disk, the word "USB" anywhere in the list decides.
+// If sysfs does not list the disk, the word "USB" anywhere in the list decides.
 bool IsUsbDisk(TNode const& node, std::string const& usbDevices) {
   if (auto const usb = UsbDeviceAbove(node)) return usbDevices.empty() || Lists(usbDevices, *usb);
   bool const isKnownNotToBe = TOSSpecific::DirExists("/sys/class/block/" + node.fName);
@@ -194,14 +194,14 @@ void AddFloppyDrive(std::vector<TRemovableMedium>& media) {
 
 std::string TOSSpecific::MountDevice(std::string device) {
   std::string const mountPoint = MountPointOf(device);
-  // Whatever is mounted there already, it stays and will do. Kept.
+  // Anything that is mounted there already stays, and is accepted. Kept.
   if (Succeeds("mount | grep \"" + mountPoint + " type\" >/dev/null")) return mountPoint;
   if (Succeeds("mount " + device + " " + mountPoint + " 2>/dev/null")) return mountPoint;
   if (Succeeds("mount " + device + "1 " + mountPoint + " 2>/dev/null")) return mountPoint;
   throw TZEPException(kZEPStatusFileSystemError);
 }
 
-// The device is not looked at, only the mount point counts. Kept.
+// The device is ignored; only the mount point is used. Kept.
 void TOSSpecific::UnmountDevice(std::string, std::string mountPoint) {
   if (!Succeeds("umount " + mountPoint + " 2> /dev/null")) throw TZEPException(kZEPStatusFileSystemError);
 }
@@ -210,7 +210,7 @@ void TOSSpecific::getxBMCVirtualDevices(int kind, std::vector<std::string>& devi
   if (kind < 0 || kind >= static_cast<int>(std::size(kProbes))) return;
   TProbe const& probe = kProbes[kind];
   std::string const output = SpawnProcess("hwinfo", std::vector<std::string>{probe.fOption}, kProbeTimeoutSeconds);
-  // A CD-ROM's alias is cut off even when the whole text is asked for. Kept.
+  // A CD-ROM's alias is removed even when the caller wants the complete text. Kept.
   bool const hasAlias = keepWhole && kind != kCdRom;
   for (std::string const& found : DeviceFilesIn(output, probe.fHeader, probe.fMarker)) {
     std::string const file = hasAlias ? found : WithoutAlias(found);

@@ -11,7 +11,7 @@
 
 namespace NQRVZEP20 {
 
-// All in this file and in this order, because one is made from others when the library is loaded.
+// All in this file and in this order, because one is built from others when the library is loaded.
 std::string const TOSSpecific::kFileSeparator = "/";
 std::string const TOSSpecific::kDynamicModuleExtension = ".so";
 std::string const TOSSpecific::kZEPPluginExtension = "pi";
@@ -25,8 +25,8 @@ namespace {
 
 constexpr std::size_t kLongestFileName = 511;  // of the core library
 
-// The file of the loaded object that holds this very function: the core library. A function of this file is asked about,
-// because the address of an exported one may be that of its stub in a program.
+// The file of the core library: the loaded object that contains this function. The function is local to this file, because the
+// address of an exported one may be that of its stub in a program.
 char const* FileOfThisLibrary() {
   Dl_info info{};
   if (::dladdr(reinterpret_cast<void*>(&FileOfThisLibrary), &info) == 0) return nullptr;
@@ -54,7 +54,7 @@ std::string CompanionPath(std::string const& pluginPath, std::string const& kind
   std::string path = pluginPath.substr(0, end);
 
   if (kind != "cmpi") {
-    // The first "lib" of the whole path goes, which may be that of a directory: "/usr/lib/p/libDisk.pi.so" gives
+    // The first "lib" in the path is removed, even when it is part of a directory: "/usr/lib/p/libDisk.pi.so" gives
     // "/usr//p/libDisk.properties.xml". Kept.
     std::size_t const prefix = pluginPath.find("lib");
     if (prefix == std::string::npos) throw TZEPException(kZEPStatusFail);
@@ -63,7 +63,7 @@ std::string CompanionPath(std::string const& pluginPath, std::string const& kind
   return path + documentEnding;
 }
 
-// Null when it cannot be loaded. No handle is ever closed: what is loaded stays to the end of the process.
+// Null when it cannot be loaded. No handle is ever closed: a loaded plug-in stays until the end of the process.
 void* Load(std::string const& path) { return ::dlopen(path.c_str(), RTLD_NOW | RTLD_GLOBAL); }
 
 }  // namespace
@@ -72,10 +72,11 @@ std::string TOSSpecific::GetZEPRootPath() {
   char const* const file = FileOfThisLibrary();
   if (file == nullptr || *file == '\0') throw TZEPException(kZEPStatusFileSystemError);
   std::string const path = file;
-  // Refused rather than cut short: what is left of a longer name would name another directory.
+  // Refused, not cut: the beginning of a longer name would be another directory.
   if (path.size() > kLongestFileName) throw TZEPException(kZEPStatusFileSystemError);
   std::size_t const separator = path.rfind(kFileSeparator);
-  return separator == path.npos ? "." : path.substr(0, separator);  // a bare name was found in the working directory
+  return separator == path.npos ? "."
+                                : path.substr(0, separator);  // a name without a directory was found in the working directory
 }
 
 std::vector<std::string> TOSSpecific::FindPlugins(std::string root, std::string kind) {

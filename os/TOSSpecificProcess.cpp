@@ -16,9 +16,9 @@
 namespace NQRVZEP20 {
 namespace {
 
-// ---- What is run ----
+// ---- The program ----
 
-// Strings as exec wants them: an array of pointers to copies, ended by a null pointer.
+// Strings in the form that exec needs: an array of pointers to copies, ended by a null pointer.
 class TStringArray {
 public:
   explicit TStringArray(std::vector<std::string> strings) : fStrings(std::move(strings)) {
@@ -51,7 +51,7 @@ std::string EachWithABlank(std::vector<std::string> const& strings) {
 struct TProgram {
   std::string const& fPath;
   TStringArray const& fArguments;
-  TStringArray const* fEnvironment;  // null: the caller's, and the path is searched on PATH
+  TStringArray const* fEnvironment;  // null: the caller's; the program is then searched on PATH
 };
 
 // Returns only when it fails.
@@ -66,13 +66,14 @@ struct TPipe {
   TUniqueFd fReadEnd, fWriteEnd;
 };
 
-// The descriptor, or in its place one above standard error: the child puts its own there and closes the pipe's.
+// The descriptor, or a duplicate above standard error: in the child the lower descriptors become its output, and the pipe's
+// are closed.
 TUniqueFd AboveStandardError(int fd) {
   TUniqueFd owner(fd);
   return fd > STDERR_FILENO ? std::move(owner) : TUniqueFd(::fcntl(fd, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
 }
 
-// Closed on exec, so that a child that another thread starts meanwhile does not hold this one's output open as long as it lives.
+// Closed on exec, so that a child started meanwhile by another thread does not hold this child's output open.
 TPipe MakePipe() {
   int ends[2];
   if (::pipe2(ends, O_CLOEXEC) != 0) return TPipe();
@@ -81,7 +82,7 @@ TPipe MakePipe() {
 
 // ---- The child ----
 
-// Holds back every signal of the thread.
+// Blocks every signal of the thread.
 class TSignalsHeldBack {
 public:
   TSignalsHeldBack() {
@@ -99,7 +100,7 @@ private:
   sigset_t fOldMask;
 };
 
-// What exec would do anyway, done before signals are let through: a handler that ran in the child would change the
+// Exec would reset the handlers, too, but signals are unblocked before it: a handler that ran in the child would change the
 // caller's memory.
 void DropSignalHandlers() {
   for (int number = 1; number < NSIG; ++number) {
@@ -111,7 +112,7 @@ void DropSignalHandlers() {
   }
 }
 
-// The child's whole life before exec. It still shares the caller's memory, so nothing is changed, freed or allocated.
+// Everything that the child does before exec. It still shares the caller's memory, so it changes, frees and allocates nothing.
 [[noreturn]] void ExecInChild(TProgram const& program, int readEnd, int writeEnd, sigset_t const& signalMask) {
   ::close(STDOUT_FILENO);
   ::dup2(writeEnd, STDOUT_FILENO);
@@ -123,8 +124,8 @@ void DropSignalHandlers() {
   ::_exit(Exec(program));  // 255
 }
 
-// vfork lends the child the caller's memory instead of copying its page tables, and holds this thread until the child's
-// exec: a start takes as long in a large process as in a small one.
+// vfork lends the child the caller's memory instead of copying its page tables, and suspends this thread until the child's exec.
+// Starting a child therefore takes no longer in a large process than in a small one.
 pid_t StartChildOrThrow(TProgram const& program, TPipe const& pipe) {
   TSignalsHeldBack const signals;
   pid_t const child = ::vfork();
@@ -137,8 +138,8 @@ pid_t StartChildOrThrow(TProgram const& program, TPipe const& pipe) {
 
 bool CanBeWatched(TUniqueFd const& readEnd) { return readEnd.get() < FD_SETSIZE; }
 
-// As select: above 0 when there is something to read or nothing will come any more, 0 after too long a silence, below 0
-// for a failure, an interruption among them.
+// Like select: above 0 when a read would not block (data or the end of the output), 0 when the silence lasted too long, below 0
+// for a failure or an interruption.
 int WaitForOutput(int readEnd, int timeoutSeconds) {
   fd_set readable;
   FD_ZERO(&readable);
@@ -150,7 +151,7 @@ int WaitForOutput(int readEnd, int timeoutSeconds) {
 constexpr std::size_t kChunkSize = 4095;
 constexpr std::size_t kPipeSize = 16 * kChunkSize;  // as much as a pipe holds
 
-// Appends each chunk up to its first zero byte; the rest of a chunk behind one is lost. Kept.
+// Appends each chunk up to its first zero byte; the rest of such a chunk is lost. Kept.
 void AppendChunks(std::string_view text, std::string& output) {
   for (; !text.empty(); text.remove_prefix(std::min(kChunkSize, text.size()))) {
     std::string_view const chunk = text.substr(0, kChunkSize);
@@ -158,7 +159,7 @@ void AppendChunks(std::string_view text, std::string& output) {
   }
 }
 
-// Reads to the end of the output; false, with the reason in the log, when that was not reached.
+// Reads to the end of the output. Returns false, with the reason in the log, when it did not reach the end.
 bool CollectOutput(int readEnd, std::string const& path, int timeoutSeconds, std::string& output) {
   std::vector<char> buffer(kChunkSize);
   for (;;) {
@@ -173,7 +174,7 @@ bool CollectOutput(int readEnd, std::string const& path, int timeoutSeconds, std
     }
     ssize_t const got = ::read(readEnd, buffer.data(), buffer.size());
     if (got == 0) return true;
-    if (got < 0) continue;  // nothing is appended, and the loop goes on. Kept.
+    if (got < 0) continue;  // nothing is appended, and the loop continues. Kept.
     AppendChunks({buffer.data(), static_cast<std::size_t>(got)}, output);
     if (static_cast<std::size_t>(got) == buffer.size()) buffer.resize(kPipeSize);  // a large output is read in larger pieces
   }
@@ -206,12 +207,12 @@ int Run(TProgram const& program, std::string& output, int timeoutSeconds) {
 
   pid_t const child = StartChildOrThrow(program, pipe);
   pipe.fWriteEnd.reset();
-  // A child whose output was not read to its end is neither ended nor waited for. Kept.
+  // A child whose output was not read to the end is neither terminated nor waited for. Kept.
   if (!CollectOutput(pipe.fReadEnd.get(), program.fPath, timeoutSeconds, output)) return -1;
   return ResultOf(child);
 }
 
-// The pieces between single blanks, empty ones among them.
+// The pieces between single blanks, including empty ones.
 std::vector<std::string> CutAtBlanks(std::string const& text) {
   std::vector<std::string> pieces;
   std::size_t start = 0;

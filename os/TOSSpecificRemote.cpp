@@ -13,23 +13,23 @@ namespace {
 constexpr unsigned char kStorage = 0x0A;
 constexpr unsigned char kReadFruData = 0x11;
 constexpr unsigned char kFruDevice = 0x00;
-constexpr unsigned char kBytesAsked = 0x1E;
+constexpr unsigned char kByteCount = 0x1E;
 constexpr unsigned kTypeAndModelOffset = 0x01AC;
 constexpr unsigned kSerialNumberOffset = 0x01CC;
 
-// Asks the controller for FRU data. The session stays open. Kept.
+// Queries the controller for FRU data. The session stays open. Kept.
 std::optional<TIpmiResponse> ReadFruData(unsigned offset) {
   auto const low = static_cast<unsigned char>(offset & 0xFF);
   auto const high = static_cast<unsigned char>(offset >> 8);
   TIpmiResponse response;
-  TIpmiResult const result = SendIpmiCommand({kStorage, kReadFruData, {kFruDevice, low, high, kBytesAsked}}, response);
+  TIpmiResult const result = SendIpmiCommand({kStorage, kReadFruData, {kFruDevice, low, high, kByteCount}}, response);
   return result ? std::optional(response) : std::nullopt;
 }
 
 // The response as text: byte 0 is the count, the data follow.
 std::string_view TextOf(TIpmiResponse const& response) { return reinterpret_cast<char const*>(response.data()); }
 
-// `count` characters of the response from `place` on, also when the answer is shorter and zeros stand there.
+// `count` characters of the response from `place` on. Characters after the end of a shorter answer are zeros.
 std::string CharactersOf(TIpmiResponse const& response, std::size_t place, std::size_t count) {
   return std::string(reinterpret_cast<char const*>(response.data()) + place, count);
 }
@@ -38,7 +38,7 @@ struct TAccess {
   std::string const &host, &user, &password;
 };
 
-// Reads from `offset` of the FRU data of a controller what `fieldOf` takes out of the response.
+// Reads the FRU data of a controller from `offset` on, and returns the field that `fieldOf` finds in the response.
 template <class TField>
 std::string ReadRemote(std::string_view operation, TAccess const& access, unsigned offset, TField fieldOf) {
   if (!OpenIpmiConnection(access.host, access.user, access.password)) return "";

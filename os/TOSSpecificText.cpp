@@ -24,7 +24,7 @@ bool TOSSpecific::breakApartVersion(std::string& tail, std::string& head) {
 std::vector<std::string> TOSSpecific::multiStringTok(char* buffer, unsigned long length, char separator) {
   std::vector<std::string> strings;
   if (length < 2) return strings;
-  // A string that ends at this mark or behind it is not taken, so nothing from the mark on is looked at.
+  // A string that ends at or after this mark is dropped, so no byte from the mark on is read.
   char const* const endMark = buffer + length - 2;
   char const* start = buffer;
   strings.reserve(8);  // more than most sets have

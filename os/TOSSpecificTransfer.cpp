@@ -22,7 +22,7 @@ constexpr TCurlMessages kTransferMessages = {
     "TOSSpecific|CurlTransferFile: Error opening curl library: ", "TOSSpecific|CurlTransferFile: Error loading curl library: ",
     "TOSSpecific|CurlTransferFile: Error initalizing curl", "TOSSpecific|CurlTransferFile: Error configuring curl error buffer"};
 
-constexpr unsigned long kRefused = 0xFFFFFFFF;  // no chunk is as long, so libcurl stops
+constexpr unsigned long kRefused = 0xFFFFFFFF;  // no chunk has this length, so libcurl stops
 
 // ---- Downloads ----
 
@@ -30,7 +30,7 @@ bool CanBeRead(std::string const& path) { return TUniqueFile(std::fopen(path.c_s
 
 // Asks until the answer is one of "y", "Y", "n" and "N". The end of the input counts as "n".
 bool MayOverwrite() {
-  std::cin.clear();  // an end that was met earlier does not count
+  std::cin.clear();  // an earlier end of the input does not count
   std::clearerr(stdin);
   std::string answer;
   do {
@@ -40,7 +40,7 @@ bool MayOverwrite() {
   return answer == "y" || answer == "Y";
 }
 
-// Whether nothing is in the way of a download into that file, or was and is gone now.
+// Whether a download may create that file: it does not exist, or was deleted with the user's consent.
 bool MakeWayFor(std::string const& path) {
   if (!CanBeRead(path)) return true;
   if (!MayOverwrite()) return false;
@@ -71,7 +71,7 @@ void SetUrl(TCurl& curl, std::string const& url) {
   curl.Set(CURLOPT_URL, url.c_str(), "TOSSpecific|CurlTransferFile: Error setting curl target");
 }
 
-// On a download, too: an FTP server makes the missing directories before it finds that the file is missing. Kept.
+// Also for a download: on an FTP server the missing directories are made before the file is found to be missing. Kept.
 void CreateMissingDirectories(TCurl& curl) {
   curl.Set(CURLOPT_FTP_CREATE_MISSING_DIRS, 1L,
            "TOSSpecific|CurlTransferFile: Error setting curl option: CURLOPT_FTP_CREATE_MISSING_DIRS");
@@ -94,7 +94,7 @@ void Download(TCurl& curl, std::string const& url, std::string const& localFile)
   PerformTransfer(curl);
 }
 
-// libcurl takes a read that fails for the end of the file: what arrived is cut off there.
+// libcurl treats a failing read as the end of the file: the uploaded file ends there.
 void CheckWasReadToItsEnd(std::FILE* stream) {
   if (std::ferror(stream) == 0) return;
   LogErrorAndThrow(kZEPStatusAccessDenied, kTransfer, "Error performing command: the local file cannot be read to its end");
@@ -117,9 +117,10 @@ unsigned long curl_fwrite(void* data, unsigned long size, unsigned long count, v
   if (write == nullptr || write->fPath.empty()) return kRefused;
   write->fStream = std::fopen(write->fPath.c_str(), "ab");
   if (write->fStream == nullptr) return kRefused;
-  std::setvbuf(write->fStream, nullptr, _IONBF, 0);  // a tenth less for a download: a buffer would be made for each chunk
+  std::setvbuf(write->fStream, nullptr, _IONBF,
+               0);  // saves a tenth of a download's time: each chunk would get a buffer of its own
   unsigned long const written = std::fwrite(data, size, count, write->fStream);
-  // Some file systems tell only now that the disk is full: nothing of the chunk counts as written then.
+  // Some file systems report only now that the disk is full. The complete chunk then counts as not written.
   bool const isClosed = std::fclose(write->fStream) == 0;
   write->fStream = nullptr;
   return isClosed ? written : 0;
@@ -168,7 +169,7 @@ int TOSSpecific::DetectHostnameAvailable(std::string hostName, std::string) {
     return 1;
   }
   DebugOut("Network is ok.");
-  return 0;  // 0 means available, whatever the name says. Kept.
+  return 0;  // 0 means available, despite the name. Kept.
 }
 
 }  // namespace NQRVZEP20

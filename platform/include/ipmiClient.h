@@ -8,7 +8,7 @@
  *
  * It holds at most one session, which belongs to the whole process: use it from one thread at a time.
  *
- * Answers may take 3 s, and packets may be lost, doubled and overtaken by others on the way. A request that gets no answer is
+ * Answers may take 3 s, and the network may lose, duplicate and reorder packets. An unanswered request is
  * sent again: the first query of all every 0.5 s, the other steps of opening a session after 3.5 s and then every second, a
  * command every 3.5 s. When the first query took longer to be answered, each later wait is at least a second longer than
  * that. Every call blocks until it is done:
@@ -25,7 +25,7 @@
 extern "C" {
 #endif
 
-/* What the functions return. Other libraries may have other numbers; 0 is success with all of them. */
+/* The results of the functions. Other libraries may have other numbers; in each, 0 is success. */
 enum {
   kIpmiClientOk = 0,
   kIpmiClientWrongPassword = 1,   /* with IPMI 1.5 also a controller that is silent when the password is checked */
@@ -39,7 +39,7 @@ enum {
   kIpmiClientNoSession = 9,       /* nothing is open */
   kIpmiClientCompletionCode = 10, /* the controller answered that it did not carry the command out */
   kIpmiClientOutOfMemory = 11,
-  kIpmiClientFail = 12 /* anything else, such as answers that make no sense (an echo of the packets sent, for example) */
+  kIpmiClientFail = 12 /* anything else, such as invalid answers (an echo of the packets sent, for example) */
 };
 
 enum {
@@ -48,25 +48,25 @@ enum {
 };
 
 /*
- * Opens a session with the controller at `host` (a name or an address) and the UDP port `port`, as administrator. A
- * session that is open is closed first, also when opening fails then. IPMI 2.0 is spoken, and 1.5 with a controller that
- * knows nothing else.
+ * Opens a session with the controller at `host` (a name or an address) and the UDP port `port`, as administrator. An
+ * open session is closed first, even if opening then fails. The session uses IPMI 2.0, or 1.5 if the controller supports
+ * only that.
  */
 int OpenConnection(int mode, char const* host, char const* port, char const* user, char const* password);
 
 /*
  * Sends one command to the controller and waits for its answer. `response`: at least kIpmiClientResponseSize bytes;
- * `responseLength` comes back as the number of bytes written there, the answer's data without the completion code. When
- * the controller refuses the command, `completionCode` says why and kIpmiClientCompletionCode is returned.
+ * `responseLength` receives the number of bytes written there, the answer's data without the completion code. When
+ * the controller refuses the command, `completionCode` receives the reason and kIpmiClientCompletionCode is returned.
  *
- * A command that is refused because the session lacks the privilege is sent once more after the privilege was asked for
+ * A command that is refused because the session lacks the privilege is sent once more after the privilege was requested
  * again; with some controllers a late copy of a packet takes it away.
  *
- * A session without an answer for 20 s is opened anew before the command is sent, for controllers close idle ones. While no
- * answer comes the command is sent again within the session and with the same request number, by which the controller can
- * tell that it is the same one; it is never sent in a second session. When the call ends without an answer
+ * A session without an answer for 20 s is reopened before the command is sent, because controllers close idle ones. An
+ * unanswered command is sent again within the session and with the same request number, which shows the controller
+ * that it is the same command; it is never sent in a second session. When the call ends without an answer
  * (kIpmiClientNoAnswer) or with kIpmiClientFail, the controller may or may not have carried the command out; the session is
- * given up, and the next command opens another.
+ * abandoned, and the next command opens another.
  */
 int SendIpmiCommand(unsigned char command, unsigned char const* request, int requestLength, unsigned char* response,
                     unsigned short* responseLength, unsigned char* completionCode, unsigned char netFn);

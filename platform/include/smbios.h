@@ -8,9 +8,9 @@
  *
  * The tables are those the kernel exports (/sys/firmware/dmi/tables/DMI, which only root may read), or those in the file
  * that the environment variable ZEP_SMBIOS_TABLE names: a bare DMI table, or a dump as `dmidecode --dump-bin` writes it, with
- * an entry point of any form ("_SM3_", "_SM_", "_DMI_"). The variable is looked at by each smBiosLoad; the file read last is not
+ * an entry point of any form ("_SM3_", "_SM_", "_DMI_"). Each smBiosLoad reads the variable; the file read last is not
  * read again while it is unchanged. A table ends at its end-of-table structure (type 127), or before the first
- * incomplete structure; no more than the first 16 MiB of a file are looked at.
+ * incomplete structure; no more than the first 16 MiB of a file are read.
  *
  * A handle holds a copy of the tables and is used by one thread at a time; any number may be open.
  */
@@ -19,32 +19,32 @@
 extern "C" {
 #endif
 
-/* What the functions return: statuses of the core's list, under the core's numbers. */
+/* The results of the functions: statuses of the core, with the core's numbers. */
 enum {
   kSmbiosOk = 0,
   kSmbiosFail = 3, /* an argument that cannot be used; a file that is not a regular one or holds no table */
   kSmbiosOutOfMemory = 4,
-  kSmbiosNoMoreItems = 5,      /* there is no structure of that type, or no further one */
-  kSmbiosFileSystemError = 11, /* the tables cannot be opened or read for another reason than the two below: errno has it */
-  kSmbiosFileNotFound = 26,    /* the kernel exports no tables, or the named file is not there */
+  kSmbiosNoMoreItems = 5,      /* no structure of that type, or no further one */
+  kSmbiosFileSystemError = 11, /* the tables cannot be opened or read for a reason other than the two below: see errno */
+  kSmbiosFileNotFound = 26,    /* the kernel exports no tables, or the named file is missing */
   kSmbiosAccessDenied = 27     /* this user may not read the tables */
 };
 
-/* Reads the tables and hands out a handle, null on failure. `provider` is not looked at and may be null. */
+/* Reads the tables and sets `handle`, to null on failure. `provider` is ignored and may be null. */
 int smBiosLoad(void* provider, void** handle);
 
 /*
  * Copies the first structure of that type, string set and its double zero included, into the caller's buffer. `length`:
- * in, the buffer's size in bytes; out, the structure's. Of a structure that does not fit as much is copied as there is
- * room for, and `length` comes back larger than it was; with a size of 0 the buffer may be null. On failure the buffer
- * and `length` stay as they were.
+ * in, the buffer's size in bytes; out, the structure's. A structure that does not fit is copied in part, and `length` is
+ * then larger than it was; with a size of 0 the buffer may be null. On failure the buffer and `length` do not
+ * change.
  */
 int smBiosGetFirst(void* handle, int type, void* buffer, int* length);
 
 /*
- * The same for the next structure of that type behind the one that smBiosGetFirst or smBiosGetNext copied last, whatever
- * type that one had. On a fresh handle the search begins with the first structure. A search that finds nothing leaves
- * the place where it was. The core does not use it, and a libsmbios.so without it will do.
+ * The same for the next structure of that type after the one that smBiosGetFirst or smBiosGetNext copied last, whatever
+ * its type was. On a new handle the search begins with the first structure. A search that finds nothing does not change
+ * the place. The core does not use this function, and works with a libsmbios.so without it.
  */
 int smBiosGetNext(void* handle, int type, void* buffer, int* length);
 

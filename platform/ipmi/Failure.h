@@ -3,15 +3,15 @@
 
 namespace ipmi {
 
-// What this library throws within itself. `status` is of the list in ipmiClient.h; `cause` tells whether another way to open
-// the session is worth trying.
+// The exception that this library throws internally. `status` is one of those in ipmiClient.h; `cause` shows whether another way
+// to open the session is worth trying.
 struct TFailure {
   enum ECause {
     kFinal,
     kNoVersion2,         // the controller does not speak version 2.0
-    kNoSuchCipherSuite,  // it does not take the cipher suite
-    kNoSuchPrivilege,    // it does not give the privilege, the way it was asked
-    kOutOfStep,          // the controller and this side no longer agree on how far the opening is
+    kNoSuchCipherSuite,  // it does not accept the cipher suite
+    kNoSuchPrivilege,    // it does not grant the privilege when it is requested in this way
+    kOutOfStep,          // the controller and this side disagree on the current step of the opening
   };
 
   int status;

@@ -25,10 +25,10 @@ public:
   // Fields with these bytes. Bytes after the end of the form are ignored.
   TFields(fiid_field_t* form, TByteVector const& bytes);
 
-  // Nothing when the fields end before it.
+  // Nothing when the fields end before this one.
   std::optional<std::uint64_t> Find(char const* name) const;
 
-  // These throw TFailure{kIpmiClientFail} when there is no such value.
+  // Each throws TFailure{kIpmiClientFail} when the value is missing.
   std::uint64_t Get(char const* name) const;
   TByteVector Data(char const* name) const;
   TByteVector Bytes() const;  // all

@@ -16,10 +16,10 @@ constexpr std::size_t kLongestPacket = 512;
 constexpr std::size_t kMaxRequestLength15 = 248;
 constexpr unsigned kConfidentialityKeySize = 16;  // of AES-CBC-128; the key that is derived is longer
 
-// A command or its answer as it stands in a packet.
+// A command or its answer, as it is in a packet.
 fiid_field_t kMessageForm[] = {{8 * 1024, "message", FIID_FIELD_OPTIONAL | FIID_FIELD_LENGTH_VARIABLE}, {0, "", 0}};
 
-// The bytes of a packet where the kind of it can be seen.
+// The offsets of the bytes that show the kind of a packet.
 constexpr std::size_t kPayloadPlace = 5;
 constexpr unsigned char kPayloadType = 0x3F, kIsAuthenticated = 0x40, kIsEncrypted = 0x80;
 
@@ -54,11 +54,11 @@ TFields MessageHeader(TMessage const& message) {
 
 TFields MessageBody(TMessage const& message) { return TFields(kMessageForm, Joined({message.command}, message.data)); }
 
-// The parts of a packet from the controller that a message is made of.
+// The parts of the controller's packet that form a message.
 struct TMessageParts {
   TFields header{tmpl_lan_msg_hdr_rs}, body{kMessageForm}, trailer{tmpl_lan_msg_trlr};
 
-  // False when it is none of a controller, or was damaged on the way.
+  // False when it is not a controller's packet, or was damaged in transit.
   bool ReadReply(TReply& reply) const {
     constexpr std::size_t kBeforeData = 2;  // the command and the completion code
     TByteVector const bytes = body.Bytes();
@@ -69,11 +69,11 @@ struct TMessageParts {
     reply.command = bytes[0];
     reply.completionCode = bytes[1];
     reply.data.assign(bytes.begin() + kBeforeData, bytes.end());
-    return reply.netFn % 2 == 1;  // a request has an even one
+    return reply.netFn % 2 == 1;  // that of a request is even
   }
 };
 
-// Reading what a packet lacks is no failure of the caller's.
+// A value that is missing in a packet is not a failure of the caller.
 template <class TRead>
 EVerdict NonsenseIfUnreadable(TRead const& read) try {
   return read();
@@ -177,7 +177,7 @@ TPacket TEnvelope2::Pack(TMessage const& message) {
 }
 
 EVerdict TEnvelope2::Unpack(TPacket const& packet, TReply& reply) const {
-  if (Is15(packet)) return EVerdict::kOther;  // a late answer to the first query of all
+  if (Is15(packet)) return EVerdict::kOther;  // a late answer to the first query
   if (!Is2(packet) || !IsOfController(PayloadByte(packet) & kPayloadType)) return EVerdict::kNonsense;
   if (PayloadByte(packet) != (IPMI_PAYLOAD_TYPE_IPMI | kIsAuthenticated | kIsEncrypted)) return EVerdict::kOther;
   return NonsenseIfUnreadable([&] {
@@ -215,7 +215,7 @@ TPacket PackPayload(unsigned char type, TFields const& payload) {
 }
 
 EVerdict UnpackPayload(TPacket const& packet, unsigned char type, TFields& payload) {
-  if (Is15(packet)) return EVerdict::kOther;  // a late answer to the first query of all
+  if (Is15(packet)) return EVerdict::kOther;  // a late answer to the first query
   if (!Is2(packet) || !IsOfController(PayloadByte(packet) & kPayloadType)) return EVerdict::kNonsense;
   if (PayloadByte(packet) != type) return EVerdict::kOther;
   return NonsenseIfUnreadable([&] {

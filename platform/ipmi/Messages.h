@@ -24,7 +24,7 @@ struct TReply {
   TByteVector data;
 };
 
-// The request whose command and data are in the fields, and what an answer says in fields of that form.
+// The request whose command and data are in the fields, and the data of an answer in fields of that form.
 TMessage MessageOf(unsigned char netFn, unsigned char sequence, TFields const& request);
 TFields FieldsOf(fiid_field_t* form, TReply const& reply);
 
@@ -35,17 +35,18 @@ class IEnvelope {
 public:
   virtual ~IEnvelope() = default;
 
-  // A packet with the session's next number, for a message that is sent again too: controllers drop a number that they know.
+  // A packet with the session's next number, also for a message that is sent again: controllers drop a number that they have
+  // seen.
   // Throws TFailure{kIpmiClientBadArgument} when the message is too long or has a reserved network function.
   virtual TPacket Pack(TMessage const& message) = 0;
 
-  // kAnswer when the packet has a reply of this session, to any message, that is newer than those accepted.
+  // kAnswer when the packet contains a reply of this session, to any message, that is newer than all accepted ones.
   virtual EVerdict Unpack(TPacket const& packet, TReply& reply) const = 0;
 
-  // The number by which the controller knows the session.
+  // The number by which the controller identifies the session.
   virtual std::uint32_t SessionId() const = 0;
 
-  // Packets of the session up to this reply's are no answers any more: they may be copies.
+  // Later, packets of the session up to this reply's no longer count as answers: they may be copies.
   void Accept(TReply const& reply) { fNewest = reply.packet; }
 
 protected:
@@ -115,7 +116,7 @@ private:
 TPacket PackPayload(unsigned char type, TFields const& payload);
 EVerdict UnpackPayload(TPacket const& packet, unsigned char type, TFields& payload);
 
-// Whether the packet has that payload, encrypted: as only a session that is open sends it.
+// Whether the packet has that payload, encrypted: only an open session sends it so.
 bool IsEncryptedPayload(TPacket const& packet, unsigned char type);
 
 }  // namespace ipmi

@@ -48,7 +48,7 @@ void CheckActivation(unsigned char completionCode) {
   }
 }
 
-// A controller is silent to a wrong password.
+// A controller does not answer a wrong password.
 TReply AskSigned(TOpening const& opening, IEnvelope& envelope, TMessage const& message) try {
   return Ask(opening.link, envelope, message, opening.waits, opening.deadline);
 } catch (TFailure const& failure) {
@@ -72,7 +72,7 @@ TSession15 Activate(TOpening const& opening, TFields const& challenge) {
   TFields const answer = FieldsOf(tmpl_cmd_activate_session_rs, reply);
   session.id = static_cast<std::uint32_t>(answer.Get("session_id"));
   session.nextPacket = static_cast<std::uint32_t>(answer.Get("initial_inbound_sequence_number"));
-  // Some controllers want a signature of this step only.
+  // Some controllers require a signature in this step only.
   session.authentication = static_cast<unsigned char>(answer.Get("authentication_type"));
   return session;
 }

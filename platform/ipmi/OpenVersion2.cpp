@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Opening a session of version 2.0: the controller is asked for one, both sides exchange random numbers, and each proves by
-// them that it knows the password.
+// Opening a session of version 2.0: the client requests a session, both sides exchange random numbers, and each uses them to
+// prove that it knows the password.
 
 #include "platform/include/ipmiClient.h"
 #include "platform/ipmi/Failure.h"
@@ -18,13 +18,13 @@ constexpr TCipherSuite kSuite3 = {IPMI_AUTHENTICATION_ALGORITHM_RAKP_HMAC_SHA1, 
 constexpr TCipherSuite kSuite17 = {IPMI_AUTHENTICATION_ALGORITHM_RAKP_HMAC_SHA256, IPMI_INTEGRITY_ALGORITHM_HMAC_SHA256_128,
                                    IPMI_CONFIDENTIALITY_ALGORITHM_AES_CBC_128};
 
-// The size of what the suite's authentication algorithm calculates.
+// The size of the result of the suite's authentication algorithm.
 unsigned DigestSize(TCipherSuite const& suite) {
   bool const isSha256 = suite.authentication == IPMI_AUTHENTICATION_ALGORITHM_RAKP_HMAC_SHA256;
   return isSha256 ? IPMI_HMAC_SHA256_DIGEST_LENGTH : IPMI_HMAC_SHA1_DIGEST_LENGTH;
 }
 
-// What the status in a controller's answer means. `otherwise`: the cause of one that tells nothing else.
+// The failure that the status in a controller's answer stands for. `otherwise`: the cause for every other status.
 void CheckStatus(unsigned status, TFailure::ECause otherwise) {
   switch (status) {
     case RMCPPLUS_STATUS_NO_ERRORS:
@@ -52,7 +52,7 @@ void CheckStatus(unsigned status, TFailure::ECause otherwise) {
 
 unsigned StatusIn(TFields const& answer) { return static_cast<unsigned>(answer.Get("rmcpplus_status_code")); }
 
-// An opening while it goes on. A step that is sent again keeps its tag.
+// An opening in progress. A step that is sent again keeps its tag.
 class TOpening2 {
 public:
   TOpening2(TOpening const& opening, TWay const& way)
@@ -78,7 +78,7 @@ private:
   TByteVector OwnProof() const;
   void CheckProof(TFields const& answer) const;
 
-  // libfreeipmi wants no text rather than an empty one.
+  // libfreeipmi requires a null pointer instead of an empty text.
   char const* Password() const { return PasswordSize() != 0 ? fOpening.target.password.data() : nullptr; }
   unsigned PasswordSize() const { return static_cast<unsigned>(fOpening.target.password.size()); }
   char const* User() const { return UserSize() != 0 ? fOpening.target.user.data() : nullptr; }
@@ -106,13 +106,13 @@ TFields TOpening2::Step(unsigned char type, TFields const& request, unsigned cha
 EVerdict TOpening2::VerdictOn(TPacket const& packet, unsigned char type, TFields& answer) const {
   EVerdict const verdict = UnpackPayload(packet, type, answer);
   if (verdict != EVerdict::kAnswer) return verdict;
-  // A refusal may end before the number of the session.
+  // A refusal may end before the session number.
   bool const isOfStep = answer.Find("message_tag") == fTag && answer.Find("remote_console_session_id").value_or(fOwnId) == fOwnId;
   return isOfStep ? EVerdict::kAnswer : EVerdict::kOther;
 }
 
 void TOpening2::AskForSession() {
-  // Some controllers give no session when a privilege is named; one that the account does not have shows later.
+  // Some controllers refuse a session when a privilege is named. A privilege that the account lacks is found out later.
   unsigned char const privilege = fWay.namesPrivilege ? kPrivilege : IPMI_PRIVILEGE_LEVEL_HIGHEST_LEVEL;
   TFields request(tmpl_rmcpplus_open_session_request);
   Checked(::fill_rmcpplus_open_session(++fTag, privilege, fOwnId, fSuite.authentication, fSuite.integrity, fSuite.confidentiality,
@@ -164,7 +164,7 @@ TByteVector TOpening2::OwnProof() const {
   return proof;
 }
 
-// The answer may be lost for good: a controller that has opened the session refuses a copy of the request, or is silent to it.
+// The answer may be lost for good: a controller that has opened the session refuses or ignores a copy of the request.
 void TOpening2::ProveToKnowThem() try {
   TByteVector const proof = OwnProof();
   TFields request(tmpl_rmcpplus_rakp_message_3);
@@ -178,7 +178,7 @@ void TOpening2::ProveToKnowThem() try {
   };
   Exchange(fOpening.link, {[&] { return PackPayload(IPMI_PAYLOAD_TYPE_RAKP_MESSAGE_3, request); }, judge}, fOpening.waits,
            fOpening.deadline);
-  if (!isOpenAlready) CheckProof(answer);  // else its next answer, signed with the session's key, is as good a proof
+  if (!isOpenAlready) CheckProof(answer);  // otherwise its next answer, signed with the session's key, proves the same
 } catch (TFailure const& failure) {
   if (failure.status != kIpmiClientNoAnswer) throw;
   throw TFailure{kIpmiClientNoAnswer, TFailure::kOutOfStep};

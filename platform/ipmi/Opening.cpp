@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// What opening a session has in common in both versions.
+// The steps of opening a session that both versions share.
 
 #include "platform/ipmi/Opening.h"
 
@@ -15,7 +15,7 @@
 namespace ipmi {
 namespace {
 
-// Some controllers have accounts without a name or without a password only.
+// Some controllers have only accounts without a name, or only accounts without a password.
 void CheckAccounts(TContact const& contact, TTarget const& target) {
   auto const given = [](std::string const& text) { return text.empty() ? nullptr : text.c_str(); };
   fiid_obj_t const capabilities = contact.capabilities.Object();
@@ -38,7 +38,7 @@ TContact MakeContact(TLink& link, TWaits const& waits, TClock::time_point deadli
   TFields request(tmpl_cmd_get_channel_authentication_capabilities_rq);
   Checked(::fill_cmd_get_channel_authentication_capabilities(IPMI_CHANNEL_NUMBER_CURRENT_CHANNEL, IPMI_PRIVILEGE_LEVEL_ADMIN,
                                                              IPMI_GET_IPMI_V20_EXTENDED_DATA, request.Object()));
-  // The query changes nothing, so that each sending may have a number of its own: it tells which one was answered.
+  // The query changes nothing, so each sending has a number of its own, which shows the one that was answered.
   TMessage message = MessageOf(IPMI_NET_FN_APP_RQ, 0, request);
   TEnvelope15 envelope;
   std::map<unsigned char, TClock::time_point> sent;

@@ -5,21 +5,21 @@
 
 namespace ipmi {
 
-// Which controller, and as whom. The password is wiped at the end.
+// The controller and the account. The password is wiped by the destructor.
 struct TTarget {
   std::string host, port, user, password;
 
   ~TTarget();
 };
 
-// The first thing to ask a controller, outside of a session: what it speaks.
+// The answer to the first query, outside of a session: the versions that the controller supports.
 struct TContact {
   TFields capabilities;                  // tmpl_cmd_get_channel_authentication_capabilities_rs
   std::chrono::milliseconds answerTime;  // from the query to its answer
 };
 TContact MakeContact(TLink& link, TWaits const& waits, TClock::time_point deadline);
 
-// What the opening of a session is done with.
+// The parameters of opening a session.
 struct TOpening {
   TLink& link;
   TTarget const& target;
@@ -32,17 +32,17 @@ struct TOpening {
 struct TWay {
   enum EVersion { kVersion2, kVersion15 } version;
   unsigned char cipherSuite;
-  bool namesPrivilege;  // when the controller is asked for a session
+  bool namesPrivilege;  // in the request for a session
 };
 
-// Opens a session. What it is packed in refers to the target's password. Throws TFailure; the controller may have opened a
-// session then, about which this side knows nothing.
+// Opens a session. The envelope refers to the target's password. Throws TFailure; the controller may nevertheless have opened a
+// session, which this side does not know.
 std::unique_ptr<IEnvelope> OpenSession(TOpening const& opening, TWay const& way);
 
 // Makes the account of an open session administrator. Throws TFailure.
 void RaisePrivilege(TLink& link, IEnvelope& envelope, TWaits const& waits, TClock::time_point deadline);
 
-// One of the two does it.
+// OpenSession calls one of these two.
 std::unique_ptr<IEnvelope> OpenVersion2(TOpening const& opening, TWay const& way);
 std::unique_ptr<IEnvelope> OpenVersion15(TOpening const& opening);
 

@@ -18,7 +18,7 @@
 namespace ipmi {
 namespace {
 
-// An answer of 256 bytes, with everything around it, is well below.
+// An answer of 256 bytes is well below this, including everything around it.
 constexpr std::size_t kLongestPacket = 2048;
 
 bool IsPort(std::string const& port) {
@@ -31,7 +31,7 @@ std::string WithoutBrackets(std::string const& host) {
   return hasBrackets ? host.substr(1, host.size() - 2) : host;
 }
 
-// One that reports what other hosts say of packets that they did not take.
+// A socket that reports the errors with which other hosts answer packets that they refuse.
 int UnconnectedSocket(int family) {
   int const socket = ::socket(family, SOCK_DGRAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0);
   if (socket < 0 && (errno == ENOMEM || errno == ENOBUFS)) throw std::bad_alloc();
@@ -104,7 +104,7 @@ void TLink::TakeErrors() {
   int error = 0;
   socklen_t size = sizeof error;
   if (::getsockopt(fSocket.get(), SOL_SOCKET, SO_ERROR, &error, &size) == 0 && error == ECONNREFUSED) fIsRefused = true;
-  // What was said waits in a queue of its own, the packet that it was said of with it.
+  // The errors are in a queue of their own, each with the packet that caused it.
   char packet[kLongestPacket];
   while (::recv(fSocket.get(), packet, sizeof packet, MSG_ERRQUEUE) >= 0) {
   }

@@ -22,18 +22,18 @@ struct TAddress {
   socklen_t size;
 };
 
-// The addresses of a host, one at least. Throws TFailure: kIpmiClientHostUnknown, or kIpmiClientBadArgument for a port that is
-// no number from 1 to 65535.
+// The addresses of a host, at least one. Throws TFailure: kIpmiClientHostUnknown, or kIpmiClientBadArgument for a port that is
+// not a number from 1 to 65535.
 std::vector<TAddress> AddressesOf(std::string const& host, std::string const& port);
 
-// A UDP socket that sends to one address. Packets are taken from any: a controller with several addresses may answer from another
-// one. Which of them is genuine is for the caller to see.
+// A UDP socket that sends to one address. It accepts packets from any address, because a controller with several addresses may
+// answer from another one. The caller checks which packets are genuine.
 class TLink {
 public:
   // Throws TFailure{kIpmiClientUnreachable} when the system has no such addresses.
   explicit TLink(TAddress const& address);
 
-  // A packet that the network loses on the way is no failure. Throws TFailure{kIpmiClientUnreachable} when the system cannot
+  // A packet that the network loses is not a failure. Throws TFailure{kIpmiClientUnreachable} when the system cannot
   // send there.
   void Send(TPacket const& packet);
 
@@ -61,11 +61,11 @@ private:
 
 enum class EVerdict {
   kAnswer,
-  kOther,    // of the controller, but no answer to this request: a copy, or one that is late
-  kNonsense  // nothing that a controller sends
+  kOther,    // from the controller, but not an answer to this request: a copy, or a late one
+  kNonsense  // not a packet that a controller sends
 };
 
-// After each sending of the request: how long its answer is waited for, before it is sent once more.
+// For each sending of the request: how long to wait for its answer before the request is sent again.
 using TWaits = std::vector<std::chrono::milliseconds>;
 
 struct TExchange {
@@ -73,8 +73,8 @@ struct TExchange {
   std::function<EVerdict(TPacket const&)> judge;
 };
 
-// Sends the request until `judge` finds its answer; packets that are none are passed over. Throws TFailure: kIpmiClientNoAnswer
-// when none came in all the time, or kIpmiClientFail when nonsense did.
+// Sends the request until `judge` finds its answer; other packets are skipped. Throws TFailure when there is no answer in time:
+// kIpmiClientNoAnswer, or kIpmiClientFail if nonsense was received.
 void Exchange(TLink& link, TExchange const& exchange, TWaits const& waits, TClock::time_point deadline);
 
 }  // namespace ipmi

@@ -12,16 +12,16 @@ namespace {
 
 constexpr std::size_t kMaxUserLength = 16, kMaxPasswordLength = 20;
 
-// Some controllers refuse a session of version 2.0 for which a privilege is named, and some one for which none is.
+// Some controllers refuse a session of version 2.0 when a privilege is named, and some when none is.
 constexpr TWay kWays[] = {
     {TWay::kVersion2, 3, false},  {TWay::kVersion2, 3, true},  //
     {TWay::kVersion2, 17, false}, {TWay::kVersion2, 17, true}, {TWay::kVersion15, 0, true},
 };
 constexpr int kNumberOfWays = sizeof kWays / sizeof *kWays;
-constexpr int kMostAttempts = 3;  // to open a session in one way
+constexpr int kMostAttempts = 3;  // of opening a session in one way
 
-// The next way that may do after one failed, or kNumberOfWays. Silence and a refused account end the same way however the
-// session is opened.
+// The next way worth trying after a failure, or kNumberOfWays. Silence and a refused account do not depend on the way, so no
+// other way is tried after them.
 int WayAfter(int way, TFailure::ECause cause) {
   TWay const& failed = kWays[way];
   auto const isWorthTrying = [&](TWay const& next) {
@@ -35,7 +35,7 @@ int WayAfter(int way, TFailure::ECause cause) {
   return static_cast<int>(std::find_if(kWays + way + 1, kWays + kNumberOfWays, isWorthTrying) - kWays);
 }
 
-// Opens the session; a copy of a packet may make another attempt necessary.
+// Opens the session. A copy of a packet may make another attempt necessary.
 std::unique_ptr<IEnvelope> OpenInStep(TOpening const& opening, TWay const& way) {
   for (int attempt = 1;; ++attempt) try {
       return OpenSession(opening, way);
@@ -59,7 +59,7 @@ TWaits TSession::Lengthened(TWaits const& waits) const {
   return lengthened;
 }
 
-// Finds the address at which the host's controller answers.
+// Finds the address of the host at which its controller answers.
 TContact TSession::Reach(TClock::time_point deadline) {
   std::vector<TAddress> const addresses = AddressesOf(fTarget.host, fTarget.port);
   for (std::size_t n = 0;; ++n) try {
@@ -97,7 +97,7 @@ TReply TSession::Send(unsigned char netFn, unsigned char command, TByteVector co
   TReply const reply = AskInSession(netFn, command, request, deadline);
   if (reply.completionCode != IPMI_COMP_CODE_INSUFFICIENT_PRIVILEGE_LEVEL) return reply;
 
-  // It was not carried out. A late copy of a packet that opened the session takes the privilege away with some controllers.
+  // The command was not carried out. With some controllers, a late copy of a packet of the opening takes away the privilege.
   try {
     RaisePrivilege(*fLink, *fEnvelope, Lengthened(fTimes.step), deadline);
   } catch (TFailure const& failure) {
@@ -107,7 +107,7 @@ TReply TSession::Send(unsigned char netFn, unsigned char command, TByteVector co
   return AskInSession(netFn, command, request, deadline);
 } catch (TFailure const& failure) {
   if (failure.status == kIpmiClientBadArgument) throw;
-  if (failure.status != kIpmiClientNoAnswer) Close();  // a controller that answers has a session to give back
+  if (failure.status != kIpmiClientNoAnswer) Close();  // a controller that answers still has the session open
   fEnvelope.reset();
   throw;
 }
@@ -121,7 +121,7 @@ TReply TSession::AskInSession(unsigned char netFn, unsigned char command, TByteV
   return reply;
 }
 
-// A controller that does not answer closes the session by itself after a while.
+// A controller that does not answer closes the idle session after a while.
 void TSession::Close(TClock::time_point deadline) noexcept try {
   if (!fEnvelope) return;
   std::unique_ptr<IEnvelope> const envelope = std::move(fEnvelope);

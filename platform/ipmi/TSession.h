@@ -5,20 +5,20 @@
 
 namespace ipmi {
 
-// How long is waited for what, in milliseconds. The defaults hold for the library; ipmiClient.h says what callers get of them.
+// How long each step waits, in milliseconds. The library uses the defaults; ipmiClient.h documents the resulting limits.
 struct TTimes {
-  // The first query of all changes nothing: it is sent often, and its answer awaited for long.
+  // The first query changes nothing: it is sent often, and its answer is awaited for a long time.
   TWaits contact = {kOften, kOften, kOften, kOften, kOften, kOften, kOften, kLong};
 
   // The later waits also last a second longer than the answer to the first query took.
   std::chrono::milliseconds beyondContact{1000};
-  // A step of the opening: the controller may calculate for long, and does so anew for each copy; then the answer was lost.
+  // A step of the opening: the controller may calculate for a long time, and starts again for each copy of the request.
   TWaits step = {kLong, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore};
-  TWaits command = TWaits(6, kLong);  // a slow controller must not get it twice
+  TWaits command = TWaits(6, kLong);  // a slow controller must not receive a command twice
   TWaits close = TWaits(3, kOften);
 
   std::chrono::milliseconds wholeOpening{60000}, wholeCommand{30000};
-  std::chrono::milliseconds idle{20000};  // well before a controller closes a session by itself
+  std::chrono::milliseconds idle{20000};  // well before controllers close an idle session
 
   static constexpr std::chrono::milliseconds kOften{500}, kOnceMore{1000}, kLong{3500};
 };
@@ -33,8 +33,8 @@ public:
 
   void Open();
 
-  // Sends a command and waits for its answer. A session that was idle is opened anew before; one that was lost too. When no
-  // answer comes the session is lost, and whether the controller carried the command out is not known.
+  // Sends a command and waits for its answer. A session that was idle or lost is reopened first. Without an answer the session is
+  // lost, and it is unknown whether the controller carried out the command.
   TReply Send(unsigned char netFn, unsigned char command, TByteVector const& request);
 
 private:
@@ -47,7 +47,7 @@ private:
   TTarget const fTarget;
   TTimes const fTimes;
   std::unique_ptr<TLink> fLink;
-  std::unique_ptr<IEnvelope> fEnvelope;  // null: there is no session
+  std::unique_ptr<IEnvelope> fEnvelope;  // null: no session is open
   std::chrono::milliseconds fContactTime{0};
   TClock::time_point fLastAnswer;
   int fWayThatWorked = 0;  // an index of kWays

@@ -28,14 +28,14 @@ namespace {
 constexpr char const* kKernelTable = "/sys/firmware/dmi/tables/DMI";
 constexpr std::size_t kMaxFileSize = 16u << 20;
 
-// A file as it was read, and the table in it.
+// The contents of a file, and the table in them.
 struct TTableFile {
   std::string contents;
   std::string_view table;  // into `contents`
 };
 using TSharedTableFile = std::shared_ptr<TTableFile const>;
 
-// An open handle, with the place behind the structure handed out last.
+// An open handle, and the place after the structure that was copied last.
 struct THandle {
   TSharedTableFile file;
   smbios::TStructureReader place;
@@ -49,20 +49,20 @@ char const* TablePath() {
 int StatusOfOpenError(int error) {
   if (error == ENOENT || error == ENOTDIR) return kSmbiosFileNotFound;
   if (error == EACCES || error == EPERM) return kSmbiosAccessDenied;
-  if (error == ENXIO) return kSmbiosFail;  // a socket, or a device that is not there
+  if (error == ENXIO) return kSmbiosFail;  // a socket, or a missing device
   return kSmbiosFileSystemError;
 }
 
-// The file read last. It need not be read again while it is the same file with the same time of change.
+// The file read last. It is not read again while the file and its time of change stay the same.
 class TLastFile {
 public:
-  // Null when that is not the file, or it has changed.
+  // Null when it is another file, or has changed.
   TSharedTableFile Find(struct stat const& status) const {
     std::lock_guard<std::mutex> const lock(fMutex);
     return fState == StateOf(status) ? fFile : nullptr;
   }
 
-  // Changes within one tick of the clock look alike: a file is kept only once its last change lies back far enough.
+  // Two changes within one clock tick have the same time, so a file is kept only when its last change is old enough.
   void Keep(struct stat const& status, TSharedTableFile file) {
     constexpr std::time_t kSettledAfterSeconds = 1;
     if (std::time(nullptr) - status.st_ctim.tv_sec <= kSettledAfterSeconds) return;
@@ -88,7 +88,7 @@ TLastFile& LastFile() {
   return *lastFile;
 }
 
-// Reads a file of that size whole, up to the limit. One byte of room more than the size shows the end with the first read.
+// Reads the complete file of that size, up to the limit. With one byte more in the buffer, the first read finds the end.
 bool ReadWhole(int fd, std::size_t size, std::string& contents) {
   contents.resize(std::min(size + 1, kMaxFileSize));
   std::size_t filled = 0;
@@ -106,7 +106,7 @@ int ReadTableFile(char const* path, TSharedTableFile& tableFile) {
   struct stat status;
   if (::stat(path, &status) == 0 && (tableFile = LastFile().Find(status))) return kSmbiosOk;
 
-  // Opening does not wait, whatever the path names.
+  // Opening does not block, even for a pipe.
   NQRVZEP20::TUniqueFd const file(::open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK));
   if (!file) return StatusOfOpenError(errno);
   if (::fstat(file.get(), &status) != 0) return kSmbiosFileSystemError;

@@ -21,7 +21,7 @@ std::uint64_t NumberAt(std::string_view bytes, std::size_t offset, std::size_t s
   return number;
 }
 
-// The whole structure that the bytes begin with, or none.
+// The complete structure at the start of the bytes, or none.
 TStructure FrontOf(std::string_view bytes) {
   if (bytes.size() < kHeaderSize) return {};
   std::size_t const formattedLength = ByteAt(bytes, 1);
@@ -33,23 +33,23 @@ TStructure FrontOf(std::string_view bytes) {
 
 bool StartsWith(std::string_view bytes, std::string_view start) { return bytes.substr(0, start.size()) == start; }
 
-// The bytes of a sound entry point add up to 0.
+// The bytes of a valid entry point add up to 0.
 bool IsSumZero(std::string_view bytes) {
   return std::accumulate(bytes.begin(), bytes.end(), 0u,
                          [](unsigned sum, char byte) { return (sum + static_cast<unsigned char>(byte)) & 0xFFu; }) == 0;
 }
 
-// Where an entry point keeps what is needed of it. All of it lies within `minLength` bytes.
+// The offsets of the needed fields of an entry point. All are within `minLength` bytes.
 struct TEntryPointLayout {
   std::string_view anchor;
-  std::size_t minLength, maxLength;  // what the length byte may say
+  std::size_t minLength, maxLength;  // allowed values of the length byte
   std::size_t lengthOffset;
   std::size_t tableSizeOffset, tableSizeBytes;
   std::size_t tableAddressOffset, tableAddressBytes;
-  bool hasInnerPart;  // with an anchor and a checksum of its own
+  bool hasInnerPart;  // which has its own anchor and checksum
 };
 
-// The length 0x1E is a known slip for 0x1F.
+// The length 0x1E is a known mistake for 0x1F.
 constexpr TEntryPointLayout kEntryPoint32 = {"_SM_"sv, 0x1E, 0x20, 5, 0x16, 2, 0x18, 4, true};
 constexpr TEntryPointLayout kEntryPoint64 = {"_SM3_"sv, 0x18, 0x20, 6, 0x0C, 4, 0x10, 8, false};
 
@@ -58,14 +58,14 @@ bool IsInnerPartSound(std::string_view entryPoint) {
   return StartsWith(inner, "_DMI_"sv) && IsSumZero(inner);
 }
 
-// The table at that address of a file, if the address lies after the entry point, cut where the file ends.
+// The table at that address of a file, cut at the end of the file; empty when the address is not after the entry point.
 std::string_view TableAt(std::string_view file, std::uint64_t address, std::size_t entryPointLength, std::uint64_t size) {
   if (address < entryPointLength || address > file.size()) return {};
   return file.substr(address, size);
 }
 
 std::string_view TableNamedBy(TEntryPointLayout const& layout, std::string_view file) {
-  if (file.size() < layout.maxLength) return {};  // no room for a table behind it
+  if (file.size() < layout.maxLength) return {};  // no room for a table after it
   std::size_t const length = ByteAt(file, layout.lengthOffset);
   if (length < layout.minLength || length > layout.maxLength) return {};
   if (!IsSumZero(file.substr(0, length))) return {};
@@ -75,7 +75,7 @@ std::string_view TableNamedBy(TEntryPointLayout const& layout, std::string_view 
   return TableAt(file, address, length, NumberAt(file, layout.tableSizeOffset, layout.tableSizeBytes));
 }
 
-// The entry point of before SMBIOS 2.1, which has no length byte.
+// The entry point from before SMBIOS 2.1, which has no length byte.
 constexpr std::size_t kLegacyLength = 0x0F;
 
 bool BeginsWithLegacyEntryPoint(std::string_view file) {

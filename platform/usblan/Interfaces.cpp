@@ -57,7 +57,7 @@ TInterface InterfaceNamed(std::string const& name, std::vector<TInterface> const
   return found != all.end() ? *found : TInterface{name, false, {}, false};
 }
 
-// One that is missing keeps its place: the others stay the nodes that they are.
+// A missing interface keeps its place, so that the others keep their nodes.
 std::vector<TInterface> Named(std::vector<TInterface> const& all, std::string const& names) {
   std::vector<TInterface> named;
   std::istringstream words(names);
@@ -65,7 +65,7 @@ std::vector<TInterface> Named(std::vector<TInterface> const& all, std::string co
   return named;
 }
 
-// The request to add an address, as the kernel's route socket takes it.
+// The request to add an address, in the form of the kernel's route socket.
 struct TNewAddress {
   nlmsghdr header;
   ifaddrmsg message;
@@ -89,7 +89,7 @@ TNewAddress NewAddress(unsigned interface, std::uint32_t address) {
   return request;
 }
 
-// What the kernel says to a request that it was asked to acknowledge: 0 or an errno value.
+// The kernel's result for a request that it has to acknowledge: 0 or an errno value.
 int AcknowledgedError(int socket) {
   struct {
     nlmsghdr header;
@@ -113,7 +113,7 @@ std::vector<TInterface> AllInterfaces() {
   std::map<std::string, TInterface> byName;
   for (ifaddrs const* entry = first; entry != nullptr; entry = entry->ifa_next) {
     std::string const name = entry->ifa_name;
-    TInterface& interface = byName[name.substr(0, name.find(':'))];  // without the label of an address
+    TInterface& interface = byName[name.substr(0, name.find(':'))];  // without the label of the address
     interface.name = name.substr(0, name.find(':'));
     interface.isUp = (entry->ifa_flags & IFF_UP) != 0;
     if (entry->ifa_addr != nullptr && entry->ifa_addr->sa_family == AF_INET && entry->ifa_netmask != nullptr)

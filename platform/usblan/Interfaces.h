@@ -19,10 +19,10 @@ struct TInterface {
   std::string name;
   bool isUp = false;
   std::vector<TAddress> addresses = {};
-  bool isThere = true;  // false: named, but the machine does not have it
+  bool isThere = true;  // false: named, but missing on this machine
 };
 
-// The controller's address of a node, and the address that this side gets; both within a network of 24 bits.
+// The controller's address of a node, and the address of this side; both are in one network of 24 bits.
 std::uint32_t ControllerAddress(int node);
 std::uint32_t OwnAddress(int node);
 constexpr int kPrefixLength = 24;
@@ -30,19 +30,19 @@ constexpr int kPrefixLength = 24;
 // All interfaces of the caller's network namespace, by name. Throws std::system_error.
 std::vector<TInterface> AllInterfaces();
 
-// Whether the interface is a USB network interface, by what the kernel tells below `classNet` ("/sys/class/net").
+// Whether the interface is a USB network interface, according to the kernel's files in `classNet` ("/sys/class/net").
 bool IsUsbNetwork(std::string const& classNet, std::string const& name);
 
-// The interfaces that lead to a controller: the place of each is its node. The ones that `named` names, separated by blanks,
-// whether `all` has them or not; with an empty `named` the USB network interfaces of `all` without an address outside of the
-// link-local range.
+// The interfaces that lead to a controller; the index of each is its node. They are the interfaces in `named`, separated by
+// blanks, even those missing in `all`. With an empty `named` they are the USB network interfaces in `all` that have no address
+// outside of the link-local range.
 std::vector<TInterface> ControllerInterfaces(std::vector<TInterface> const& all, std::string const& named,
                                              std::string const& classNet);
 
-// Whether it is up and reaches the controller of the node directly.
+// Whether the interface is up and reaches the controller of the node directly.
 bool Reaches(TInterface const& interface, int node);
 
-// Gives the interface the node's own address; one that it has already stays. Throws std::system_error.
+// Gives the interface this side's address of the node. Other addresses stay. Throws std::system_error.
 void AddOwnAddress(TInterface const& interface, int node);
 
 // Throws std::system_error.

@@ -113,7 +113,7 @@ TEST(ChkResponseTest, EachModeMakesItsOwnTests) {
       }
 }
 
-TEST(ChkResponseTest, AFailureLeavesTheStatusAsItWas) {
+TEST(ChkResponseTest, AFailureDoesNotChangeTheStatus) {
   IIPMILan& link = *IIPMILan::Initialize();
   std::string const good = Packet(EAuthentication::kNone, 0, "");
   std::string const bad = Packet(EAuthentication::kNone, 0xC1, "");

@@ -20,7 +20,7 @@ using testing::ElementsAre;
 using testing::IsEmpty;
 
 // The first test of the program, because any other test may create a link.
-TEST(NoIPMILanTest, ThereIsNoLinkBeforeInitialize) {
+TEST(NoIPMILanTest, BeforeInitializeTheLinkIsNull) {
   EXPECT_EQ(IIPMILan::GetInstance(), nullptr);
   EXPECT_EQ(TRootObject::GetipmiLanIns(), nullptr);
   EXPECT_EQ(gIPMILanHost + gIPMILanPort + gIPMILanUser + gIPMILanPass, "");

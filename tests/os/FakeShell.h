@@ -10,7 +10,7 @@ namespace NQRVZEP20 {
 // As long as it lives, commands that the library runs through system() are written down instead of run.
 class TFakeShell {
 public:
-  // What the commands return; those that are not named, `otherwise`.
+  // The results of the commands; a command that is not listed returns `otherwise`.
   explicit TFakeShell(std::map<std::string, int> results, int otherwise = 0);
   ~TFakeShell();
   TFakeShell(TFakeShell const&) = delete;
@@ -37,7 +37,7 @@ public:
   TFakeScsi& operator=(TFakeScsi const&) = delete;
 };
 
-// As long as it lives, time passes a thousand times faster for select, and the seconds it was asked to wait are written down.
+// While it lives, time passes a thousand times faster for select, and the requested seconds are recorded.
 class TFastSelect {
 public:
   TFastSelect();

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Every call of the C library that a host service makes fails in turn (tests/os/faults): what the operation reports then,
-// and that it leaves nothing behind and comes to an end.
+// Every call of the C library that a host service makes fails in turn (tests/os/faults). The operation must report the right
+// result, leak nothing, and end.
 
 #include "tests/os/HostTools.h"
 #include "tests/os/Programs.h"
@@ -16,7 +16,7 @@ namespace fs = std::filesystem;
 using TLines = std::vector<std::string>;
 
 struct TOutcome {
-  TLines lines;                      // the result, what was logged, what is left behind
+  TLines lines;                      // the result, the log entries, the leaks
   std::map<std::string, int> calls;  // of which function, and how many
   bool fired;
 };
@@ -70,7 +70,7 @@ void PrintTo(TOperation const& operation, std::ostream* stream) { *stream << ope
 
 std::string const kChild = Child("PrintsArguments");
 
-// What starting, reading and waiting for a child comes to in every operation that does it. Each names its own result when
+// The results of starting, reading and waiting for a child, in every operation that does so. Each names its own result when
 // the child ran as it should, when it was left or failed after its output was read, and before.
 std::vector<TFault> SpawnFaults(TLines const& log, std::string const& good, std::string const& badWithOutput,
                                 std::string const& badWithout, std::string const& goodWithout) {
@@ -219,7 +219,7 @@ std::vector<TOperation> Operations() {
       {"DirCopy",
        {"0, text"},
        {{"opendir", "all", EMFILE, {fileError}},
-        {"stat", "1", EIO, {"0, text"}},  // whether the destination is there: it is made
+        {"stat", "1", EIO, {"0, text"}},  // the check whether the destination exists: it is then made
         {"stat", "2", EIO, {"0"}},        // the directory in the source: passed over
         {"stat", "3", EIO, {"0, text"}},
         {"stat", "4", EIO, {"0"}},        // the file in that directory: passed over
@@ -285,7 +285,7 @@ std::vector<TOperation> Operations() {
         {"fread", "1001", EBADF, {"threw kZEPStatusAccessDenied, 1000000 bytes", uploadFailed}}}},
       {"Download",
        {"transferred, first second"},
-       {{"fopen", "1", EACCES, {"transferred, first second"}},  // whether the file is there
+       {{"fopen", "1", EACCES, {"transferred, first second"}},  // the check whether the file exists
         {"fopen",
          "2",
          EACCES,
@@ -319,7 +319,7 @@ std::vector<TOperation> Operations() {
        {{"stat", "all", EACCES, {"b", parsing, parsing, missing}},
         {"fopen64", "1", EACCES, {"b", parsing, parsing}},
         {"fclose", "1", EIO, {"a,b", parsing, parsing}},
-        {"read", "all", EIO, {"b", parsing, parsing, readingFailed}}}},  // what was there stays
+        {"read", "all", EIO, {"b", parsing, parsing, readingFailed}}}},  // the former settings stay
   };
 }
 
@@ -335,7 +335,7 @@ TEST_P(HostFaultsTest, EveryCallFailsInTurn) {
     untried.erase(fault.function);
     int const calls = clean.calls.count(fault.function) ? clean.calls.at(fault.function) : 0;
     EXPECT_TRUE(calls > 0 || kIsSanitized) << fault.function << " is not called";
-    // Of many calls with one outcome the first, the second and the last will do.
+    // Of many calls with the same outcome, the first, the second and the last are enough.
     for (int number = 1; number <= calls; ++number) {
       if (fault.number == "all" ? number > 2 && number < calls : fault.number != std::to_string(number)) continue;
       std::string const name = fault.function + ":" + std::to_string(number) + ":" + std::to_string(fault.error);

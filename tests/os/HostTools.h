@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// What the tests of the host services share.
+// Helpers that the tests of the host services share.
 
 #include "TOSSpecific.h"
 #include "core/Handles.h"
@@ -50,7 +50,13 @@ private:
   mode_t fOld;
 };
 
-// Works in another directory, and in the old one again at the end.
+inline std::string TextOf(std::size_t size) {
+  std::string text(size, ' ');
+  for (std::size_t i = 0; i < size; ++i) text[i] = static_cast<char>(i * 31 + i / 256);
+  return text;
+}
+
+// Changes the working directory, and restores it at the end.
 class TWorkingDirectory {
 public:
   explicit TWorkingDirectory(std::string const& path) : fOld(std::filesystem::current_path()) {
@@ -75,8 +81,8 @@ inline bool HasChildren() {
   return ::waitid(P_ALL, 0, &info, WEXITED | WNOHANG | WNOWAIT) == 0;
 }
 
-// The text that the function returns in a child process, whose memory, user and mounts are its own: what it changes does
-// not come back. What it throws is text as well; a child that dies, or in which an expectation fails, says so.
+// Returns the text that the function returns in a child process. The child has its own memory, user and mounts, so its changes
+// do not affect this process. An exception becomes a text as well; a child that dies, or fails an expectation, is reported.
 template <class TFunction>
 std::string InChild(TFunction function) {
   int ends[2];
@@ -121,7 +127,7 @@ inline bool MayMount() {
   return InChild([&] { return MountTmpfs(dir.Path(), "") ? "yes" : "no"; }) == "yes";
 }
 
-// Goes down into directories of 100 characters each, and then into one that makes the path as long as asked.
+// Changes into nested directories of 100 characters each, and then into one that gives the path the requested length.
 inline void GoDownTo(std::size_t length) {
   std::size_t now = std::filesystem::current_path().string().size();
   while (now < length) {

@@ -23,7 +23,7 @@ TEST(MachineIdentityTest, AProductDescriptionIsCutAtItsFirstDash) {
       {"Server Q100 -[1234AB7]-", "1234", "Server Q100 ", "AB7"},
       {"Server-[5678XY1]-", "5678", "Server", "XY1"},
       {"-[1234AB7]-", "1234", "", "AB7"},
-      {"Rack-Server Q200 -[5678XY1]-", "erve", "Rack", "r Q"},  // the first "-", wherever it stands
+      {"Rack-Server Q200 -[5678XY1]-", "erve", "Rack", "r Q"},  // the first "-", wherever it is
       {"A--[1234AB7]-", "[123", "A", "4AB"},
       {"Server -[1234]-", "1234", "Server ", "Unknown"},  // "]-" is not a model
       {"Server -[1234", "1234", "Server ", "Unknown"},
@@ -37,7 +37,7 @@ TEST(MachineIdentityTest, AProductDescriptionIsCutAtItsFirstDash) {
       {"Standard PC (i440FX + PIIX, 1996)", "0000", "Unknown", "Unknown"},
       // 7 characters with a "-" are cut all the same.
       {"123-AB7", "0000", "123", "Unknown"},
-      // What is not there in full is not given in part.
+      // An incomplete type or model is not returned.
       {"-", "0000", "", "Unknown"},
       {"A-", "0000", "A", "Unknown"},
       {"A-[", "0000", "A", "Unknown"},
@@ -77,7 +77,7 @@ TEST(MachineIdentityTest, StringsOfAStructureAreFoundByTheirNumber) {
   };
   TRow const rows[] = {
       {5, "one"},     {6, "two"},  {7, "three"}, {4, "none"},
-      {8, "none"},    {9, "none"}, {10, "none"}, {11, "none"},  // behind the formatted area
+      {8, "none"},    {9, "none"}, {10, "none"}, {11, "none"},  // after the formatted area
       {1000, "none"},
   };
   for (TRow const& row : rows) EXPECT_EQ(StringNamedAt(structure, row.offset), row.text) << row.offset;

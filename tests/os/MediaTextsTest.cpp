@@ -35,7 +35,7 @@ TEST(MediaTextsTest, FindsTheMarkedDevicesOfRealTexts) {
   }
 }
 
-TEST(MediaTextsTest, HeaderMarkerAndFileStandOnLinesInThatOrder) {
+TEST(MediaTextsTest, HeaderMarkerAndFileAreOnLinesInThatOrder) {
   struct TRow {
     std::string text;
     TLines files;

@@ -119,7 +119,7 @@ TEST_F(MkDirHierTest, ThreadsThatMakeOneTreeAtOnceAllFindIt) {
   EXPECT_EQ(failures, 0);
 }
 
-TEST_F(MkDirHierTest, LeavesWhatItMadeBeforeItStopped) {
+TEST_F(MkDirHierTest, DirectoriesMadeBeforeAFailureStay) {
   std::string const tooLong(300, 'x');
   EXPECT_STATUS(TCommUtil::MkDirHier(fDir.Path("a/b/" + tooLong + "/c")), kZEPStatusFileSystemError);
   EXPECT_TRUE(TOSSpecific::DirExists(fDir.Path("a/b")));
@@ -158,7 +158,7 @@ TEST(RemoveSpacesTest, CleansTheFirstLine) {
       {"a\x7f", ""},
       {"a\x1b[0m", ""},
       {std::string("a\0b", 3), ""},
-      {"clean\n\xff", "clean"},  // what was cut off does not count
+      {"clean\n\xff", "clean"},  // the part that was cut off does not count
       {"clean\r\xff", "clean"},
   };
   for (TRow const& row : rows) EXPECT_EQ(TCommUtil::RemoveSpaces(row.text), row.result) << testing::PrintToString(row.text);
@@ -173,7 +173,7 @@ TEST(RemoveSpacesTest, EveryOtherByteMakesItEmpty) {
   }
 }
 
-TEST(RemoveSpacesTest, ReadsAsciiWhateverTheLocale) {
+TEST(RemoveSpacesTest, ReadsAsciiInEveryLocale) {
   std::string const old = std::setlocale(LC_ALL, nullptr);
   NEEDS(std::setlocale(LC_ALL, "C.UTF-8") != nullptr, "another locale");
   EXPECT_EQ(TCommUtil::RemoveSpaces(" a\xa0 "), "");

@@ -23,7 +23,7 @@ TSettings SettingsOf(TConfig& config) {
   return settings;
 }
 
-// In a working directory of its own. Nobody asks for the instance of this process here, only in a child.
+// In a working directory of its own. Only child processes use the instance of the process.
 class TConfigTest : public testing::Test {
 protected:
   TConfigTest() : fDirectory(fDir.Path()) {}
@@ -85,7 +85,7 @@ TEST_F(TConfigTest, ReadsLongLinesAndManyOfThem) {
   std::string const key(100000, 'k'), value(1000000, 'v');
   EXPECT_EQ(SettingsIn(key + "=" + value), (TSettings{{key, value}}));
 
-  // Random keys over few bytes, so that many are alike or begin with one another, read line by line into a map.
+  // Random keys over few bytes, so that many are equal or prefixes of others, read line by line into a map.
   std::mt19937 random(7);
   for (std::size_t const commonLength : {0u, 3u, 20u}) {
     std::string text;
@@ -100,11 +100,11 @@ TEST_F(TConfigTest, ReadsLongLinesAndManyOfThem) {
   }
 }
 
-TEST_F(TConfigTest, ReadsAgainOnlyWhatItDoesNotHave) {
+TEST_F(TConfigTest, ASecondReadAddsOnlyMissingKeys) {
   WriteFile("zep.cfg", "a=1\nc=3\n");
   TConfig config;
   WriteFile("zep.cfg", "a=2\nb=2\nd=4\n");
-  EXPECT_EQ(config.getValue("b"), "");  // the file is not looked at again
+  EXPECT_EQ(config.getValue("b"), "");  // the file is not read again
   config.parseConfigFile();
   EXPECT_EQ(SettingsOf(config), (TSettings{{"a", "1"}, {"b", "2"}, {"c", "3"}, {"d", "4"}}));
 }
@@ -127,7 +127,7 @@ TEST_F(TConfigTest, AnEmptyFileIsReportedAsMissing) {
   EXPECT_EQ(LogOf([] { TConfig config; }), (TEntries{kStart, kMissing}));
 }
 
-TEST_F(TConfigTest, ADirectoryOfThatNameIsNoFile) {
+TEST_F(TConfigTest, ADirectoryOfThatNameIsNotAFile) {
   std::filesystem::create_directory("zep.cfg");
   EXPECT_EQ(LogOf([] { TConfig config; }), (TEntries{kStart, kMissing}));
 }
@@ -148,7 +148,7 @@ TEST_F(TConfigTest, AFileThatCannotBeOpenedIsPassedOverInSilence) {
 
 // ---- Asking ----
 
-TEST_F(TConfigTest, LogsWhatItAnswers) {
+TEST_F(TConfigTest, LogsItsAnswers) {
   WriteFile("zep.cfg", "key=value\n");
   TConfig config;
   EXPECT_EQ(LogOf([&] { EXPECT_EQ(config.getValue("key"), "value"); }),

@@ -52,7 +52,7 @@ protected:
 
   std::string Path(std::string const& name) const { return fDir.Path(name); }
 
-  // What one entry writes to a fresh log file, at a threshold that filters nothing and at that time.
+  // The text that one entry writes to a new log file, at a threshold that filters nothing and at that time.
   std::string WrittenAt(TFakeClock::TTime const& time, ILogger::EZEPLogSeverity severity, std::string const& message) {
     TFakeClock const clock({time});
     TLogger::SetLogThreshold(ILogger::kLogVerbose);
@@ -187,7 +187,7 @@ TEST_F(TLoggerTest, AThreadLocalObjectMayLogAtTheEndOfAThread) {
   EXPECT_EQ(ReadFile(Path("a.log")), kOpenBanner + "FDR_[Status] 3/3/2024  9:5:7 the end\n" + kCloseBanner);
 }
 
-TEST_F(TLoggerTest, WhatOutlivesTheLoggerOfAThreadGetsANewOneWithoutAFile) {
+TEST_F(TLoggerTest, ALogEntryAfterTheEndOfTheLoggerGetsANewOneWithoutAFile) {
   TLogger::GetInstance();  // the logger's own key is made first, and so ends first
   pthread_key_t key;
   ASSERT_EQ(::pthread_key_create(&key, [](void*) { TLogsAtTheEnd(); }), 0);
@@ -250,7 +250,7 @@ mode_t ModeOf(std::string const& path) {
   return status.st_mode & 07777;
 }
 
-TEST_F(TLoggerTest, AFileThatItMakesIsForItsOwnerAloneWhateverTheUmask) {
+TEST_F(TLoggerTest, ANewFileIsReadableByItsOwnerOnlyWithAnyUmask) {
   for (char const* appending : {static_cast<char const*>(nullptr), "1"})
     for (mode_t const mask : {0, 022, 077, 0277, 0777}) {
       SCOPED_TRACE(mask);
@@ -273,7 +273,7 @@ TEST_F(TLoggerTest, AFileThatInitializeMakesIsForItsOwnerAlone) {
   EXPECT_EQ(ModeOf(Path("logs/zep.log")), mode_t{0600});
 }
 
-TEST_F(TLoggerTest, AFileThatIsThereKeepsItsMode) {
+TEST_F(TLoggerTest, AnExistingFileKeepsItsMode) {
   for (char const* appending : {static_cast<char const*>(nullptr), "1"}) {
     TEnvironmentGuard const setting("QRV_YBNQI_GUI_T", appending);
     WriteFile(Path("a.log"), "");
@@ -290,7 +290,7 @@ TEST_F(TLoggerTest, AFileThatItMakesThroughALinkIsForItsOwnerAlone) {
   EXPECT_EQ(ReadFile(Path("target.log")), kOpenBanner + kCloseBanner);
 }
 
-TEST_F(TLoggerTest, LooksAtTheEnvironmentAtEachOpening) {
+TEST_F(TLoggerTest, EachOpeningReadsTheEnvironment) {
   TLogger logger;
   logger.SetLogFilename(Path("a.log"));
   TEnvironmentGuard const appending("QRV_YBNQI_GUI_T", "1");
@@ -398,7 +398,7 @@ TEST_F(TLoggerTest, InitializePutsNoSeparatorBetweenDirectoryAndName) {
   EXPECT_EQ(ReadFile(Path("azep.log")), kOpenBanner);
 }
 
-TEST_F(TLoggerTest, InitializeTakesAnEmptyName) {
+TEST_F(TLoggerTest, InitializeAcceptsAnEmptyName) {
   TLogger::SetLogFileDir(Path("a/"));
   TLogger logger;
   logger.Initialize("");
@@ -536,7 +536,7 @@ TEST_F(TLoggerTest, EachFieldOfTheTimeIsAReadingOfItsOwn) {
   EXPECT_EQ(ReadFile(Path("a.log")), kOpenBanner + "FDR_[Debug] 6/25/2024  3:12:10 probe\n");
 }
 
-// The time of the line as the C library tells it, in the zone of the process.
+// The time of the line according to the C library, in the zone of the process.
 std::string LocalTimeText() {
   std::time_t const now = std::chrono::system_clock::to_time_t(std::chrono::system_clock::now());
   std::tm const fields = *std::localtime(&now);
@@ -632,7 +632,7 @@ std::ostream& operator<<(std::ostream& out, TOutcome const& outcome) {
   return out << (outcome.recorded ? "recorded " : "") << (outcome.written ? "written " : "") << (outcome.thrown ? "thrown" : "");
 }
 
-// What comes of one entry, with a file and without.
+// The result of one entry, with a file and without.
 TOutcome OutcomeOf(int severity, std::string const& file) {
   TLogger logger;
   logger.ClearLog();
@@ -648,7 +648,7 @@ TOutcome OutcomeOf(int severity, std::string const& file) {
   return outcome;
 }
 
-TEST_F(TLoggerTest, WhatComesOfAnEntryBySeverityAndThreshold) {
+TEST_F(TLoggerTest, SeverityAndThresholdDecideWhereAnEntryGoes) {
   struct {
     int severity, threshold;
     TOutcome withFile, withoutFile;
@@ -735,7 +735,7 @@ TEST_F(TLoggerTest, PushBackLogAppendsACopy) {
   EXPECT_EQ(TLogger().GetLog().back().fSeverity, ILogger::kLogVerbose);
 }
 
-TEST_F(TLoggerTest, ClearLogEmptiesTheListAndLeavesTheFileAlone) {
+TEST_F(TLoggerTest, ClearLogEmptiesTheListAndKeepsTheFile) {
   TLogger logger;
   logger.SetLogFilename(Path("a.log"));
   logger.OutputLogEntry(ILogger::kLogStatus, "probe");

@@ -39,11 +39,11 @@ TEST_F(CaptureTest, GetFileContentsReadsToTheEndAndLeavesTheDescriptorOpen) {
     TUniqueFd const file(::open(fDir.Path("file").c_str(), O_RDONLY));
     EXPECT_EQ(TOSSpecific::GetFileContents(file.get(), "file", false), contents);
     EXPECT_NE(::fcntl(file.get(), F_GETFD), -1);
-    EXPECT_EQ(TOSSpecific::GetFileContents(file.get(), "file", false), "");  // it stands at the end now
+    EXPECT_EQ(TOSSpecific::GetFileContents(file.get(), "file", false), "");  // it is at the end now
   }
 }
 
-TEST_F(CaptureTest, GetFileContentsStartsWhereTheDescriptorStands) {
+TEST_F(CaptureTest, GetFileContentsStartsAtThePositionOfTheDescriptor) {
   WriteFile(fDir.Path("file"), "0123456789");
   TUniqueFd const file(::open(fDir.Path("file").c_str(), O_RDONLY));
   ::lseek(file.get(), 4, SEEK_SET);
@@ -64,7 +64,7 @@ TEST_F(CaptureTest, GetFileContentsReadsAPipeToItsEnd) {
   EXPECT_EQ(contents, text);
 }
 
-TEST_F(CaptureTest, GetFileContentsLogsTheContentsWhereAsked) {
+TEST_F(CaptureTest, GetFileContentsLogsTheContentsOnRequest) {
   WriteFile(fDir.Path("file"), "the contents");
   auto const read = [&](bool logContents) {
     TUniqueFd const file(::open(fDir.Path("file").c_str(), O_RDONLY));
@@ -86,7 +86,7 @@ TEST_F(CaptureTest, GetFileContentsThrowsWhenAReadFails) {
 
 // ---- CaptureFile and CaptureFileLoader ----
 
-TEST_F(CaptureTest, BothReturnTheWholeFile) {
+TEST_F(CaptureTest, BothReturnTheCompleteFile) {
   int const before = OpenDescriptors();
   for (std::string const& contents : Contents()) {
     SCOPED_TRACE(contents.size());
@@ -98,16 +98,16 @@ TEST_F(CaptureTest, BothReturnTheWholeFile) {
   EXPECT_EQ(OpenDescriptors(), before);
 }
 
-TEST_F(CaptureTest, PseudoFilesAreReadWhole) {
+TEST_F(CaptureTest, PseudoFilesAreReadCompletely) {
   EXPECT_EQ(TOSSpecific::CaptureFile("/dev/null"), "");
   EXPECT_EQ(TOSSpecific::CaptureFile("/proc/version"), ReadFile("/proc/version"));
   EXPECT_EQ(TOSSpecific::CaptureFile("/proc/cpuinfo").rfind("processor", 0), 0u);
   EXPECT_EQ(TOSSpecific::CaptureFile("/proc/self/cmdline"), ReadFile("/proc/self/cmdline"));  // zero bytes in it
   EXPECT_EQ(TOSSpecific::CaptureFile("/sys/kernel/mm/transparent_hugepage/enabled"),
-            ReadFile("/sys/kernel/mm/transparent_hugepage/enabled"));  // of size 4096, it says
+            ReadFile("/sys/kernel/mm/transparent_hugepage/enabled"));  // reports a size of 4096
 }
 
-TEST_F(CaptureTest, LogsWhatIsThere) {
+TEST_F(CaptureTest, CaptureLogsTheContents) {
   WriteFile(fDir.Path("file"), "text");
   TEntries const withContents = {"[Debug] Debug (linux toss): GetFileContents() Returned: text"};
   EXPECT_EQ(LogOf([&] { TOSSpecific::CaptureFile(fDir.Path("file")); }), withContents);
@@ -130,7 +130,7 @@ TEST_F(CaptureTest, CaptureFileLoaderIsEmptyWhenItCannotBeOpened) {
                         "[Debug] Please confirm that the related software/driver is properly installed."}));
 }
 
-TEST_F(CaptureTest, AFileWithoutLeaveToReadCannotBeOpened) {
+TEST_F(CaptureTest, AFileWithoutReadPermissionCannotBeOpened) {
   WriteFile(fDir.Path("secret"), "text");
   fs::permissions(fDir.Path(), fs::perms::all);
   fs::permissions(fDir.Path("secret"), fs::perms::none);
@@ -152,7 +152,7 @@ TEST_F(CaptureTest, ADirectoryOpensButCannotBeRead) {
 
 // ---- CapFileViaProc ----
 
-TEST_F(CaptureTest, CapFileViaProcReadsTheFileThatTheProgramLeft) {
+TEST_F(CaptureTest, CapFileViaProcReadsTheFileThatTheProgramWrote) {
   std::string contents = "old";
   std::string const path = fDir.Path("file");
   EXPECT_EQ(LogOf([&] {
@@ -163,7 +163,7 @@ TEST_F(CaptureTest, CapFileViaProcReadsTheFileThatTheProgramLeft) {
   EXPECT_EQ(contents, "by the program");
 }
 
-TEST_F(CaptureTest, CapFileViaProcDoesNotAskWhatBecameOfTheProgram) {
+TEST_F(CaptureTest, CapFileViaProcIgnoresTheResultOfTheProgram) {
   std::string contents;
   WriteFile(fDir.Path("file"), "was there before");
   for (char const* program : {"/nonexistent", "ExitsWith3", "PrintsNothing"}) {
@@ -173,7 +173,7 @@ TEST_F(CaptureTest, CapFileViaProcDoesNotAskWhatBecameOfTheProgram) {
   }
 }
 
-TEST_F(CaptureTest, CapFileViaProcIsEmptyWhenThereIsNoFile) {
+TEST_F(CaptureTest, CapFileViaProcIsEmptyWithoutAFile) {
   std::string contents = "old";
   std::string const path = fDir.Path("missing");
   EXPECT_EQ(
@@ -191,7 +191,7 @@ TEST_F(CaptureTest, CapFileViaProcIsEmptyWhenThereIsNoFile) {
 
 // ---- LaunchTextEditor ----
 
-// With a vi of our own on PATH, which writes down its arguments and what they hold.
+// With a vi of our own on PATH, which records its arguments and the contents of the files.
 class LaunchTextEditorTest : public testing::Test {
 protected:
   LaunchTextEditorTest() {
@@ -227,7 +227,7 @@ TEST_F(LaunchTextEditorTest, CopiesTheFileAndEditsTheCopyByTheEndOfItsPath) {
   EXPECT_EQ(Edited(), "[" + name + "]\ntext to edit[" + name.substr(name.size() - 35) + ".old]\n|its neighbour");
 }
 
-TEST_F(LaunchTextEditorTest, APathOfThirtyFiveCharactersWillJustDo) {
+TEST_F(LaunchTextEditorTest, APathOfThirtyFiveCharactersIsLongEnough) {
   TWorkingDirectory const directory(fDir.Path("work"));
   fs::create_directories("d");
   std::string const path = "d/" + std::string(33, 'x');
@@ -260,7 +260,7 @@ TEST_F(LaunchTextEditorTest, WithoutAWorkingDirectoryTheCopyGoesToTheRoot) {
             "cp " + path + " /\nvi /*" + std::string(35, 'y') + "*\n");
 }
 
-TEST_F(LaunchTextEditorTest, AWorkingDirectoryOfUpTo4095BytesWillDo) {
+TEST_F(LaunchTextEditorTest, AWorkingDirectoryOfUpTo4095BytesIsAccepted) {
   RecordCommandsOnly();
   std::string const path = "/" + std::string(40, 'y');
   auto const editIn = [&](std::size_t length) {

@@ -32,7 +32,7 @@ std::int64_t ClockMilliseconds() {
   return now.tv_sec * std::int64_t{1000} + now.tv_nsec / 1000000;
 }
 
-// What GetLocalTime gives within one second, and what the C library makes of that second.
+// The result of GetLocalTime, and the fields of the same second according to the C library.
 std::pair<TCIMDateTime, std::tm> LocalTimeAndFields() {
   for (;;) {
     std::time_t const before = ClockMilliseconds() / 1000;
@@ -174,8 +174,8 @@ TEST(GetLocalTimeTest, FollowsAClockThatJumps) {
   EXPECT_EQ(TOSSpecific::GetLocalTime().ToString(), "20310102030405.000000+000");
 }
 
-TEST(GetLocalTimeTest, LooksAtTheZoneOnEachCall) {
-  std::string const longName = "<" + std::string(100, 'X') + ">";  // what differs stands far behind
+TEST(GetLocalTimeTest, EachCallReadsTheZone) {
+  std::string const longName = "<" + std::string(100, 'X') + ">";  // the difference is far from the start
   std::pair<std::string, int> const zones[] = {{"UTC0", 0},   {"XST-1", 60},          {"XST-2", 120},
                                                {"XST-1", 60}, {longName + "-3", 180}, {longName + "-4", 240},
                                                {"", 0},       {"XST5", -300}};
@@ -218,7 +218,7 @@ TEST(GetLocalTimeTest, IsEqualTwiceWithinAMillisecond) {
   EXPECT_GT(pairs, 0);
 }
 
-TEST(GetLocalTimeTest, ServesManyThreads) {
+TEST(GetLocalTimeTest, WorksInManyThreads) {
   TEnvironmentGuard const zone("TZ", "XST-1XDT,0/0,J365/49");
   std::atomic<int> wrong{0};
   std::vector<std::thread> threads;
@@ -247,7 +247,7 @@ TEST(HostBasicsTest, NoneOfThemLogs) {
     EXPECT_TRUE(log.Entries().empty());
     EXPECT_EQ(TLogger::GetInstance()->GetLog().size(), entries);
 
-    TLogger::GetInstance()->OutputLogEntry(ILogger::kLogVerbose, "probe");  // the capture does see what is logged
+    TLogger::GetInstance()->OutputLogEntry(ILogger::kLogVerbose, "probe");  // the capture does see log entries
     EXPECT_EQ(log.Entries(), std::vector<std::string>{"[Verbose] probe"});
   });
 }
@@ -289,7 +289,7 @@ TEST(USleepTest, ASignalEndsItEarly) {
 
 // ---- Who and where ----
 
-TEST(IsAdminTest, AsksForTheRealUser) {
+TEST(IsAdminTest, ChecksTheRealUser) {
   EXPECT_EQ(TOSSpecific::IsAdmin(), ::getuid() == 0);
   EXPECT_EQ(InChild([] { return !BecomeUnprivileged()    ? "still root"
                                 : TOSSpecific::IsAdmin() ? "admin"
@@ -316,7 +316,7 @@ void MakeCapabilities(std::string const& text) {
   WriteFile("/proc/xen/capabilities", text);
 }
 
-TEST(GetRunningTypeOnXenTest, TellsHostsAndDomainsApart) {
+TEST(GetRunningTypeOnXenTest, DistinguishesHostsFromDomains) {
   NEEDS(MayMount(), "leave to mount a file system");
   EXPECT_EQ(RunningTypeWith([] {}), "2");
   EXPECT_EQ(RunningTypeWith([] { std::filesystem::create_directories("/proc/xen/capabilities"); }), "2");
@@ -332,7 +332,7 @@ TEST(GetRunningTypeOnXenTest, TellsHostsAndDomainsApart) {
             "threw kZEPStatusFileNotFound");
 }
 
-TEST(GetRunningTypeOnXenTest, ReadsNothingWhereThereIsNoXen) {
+TEST(GetRunningTypeOnXenTest, ReadsNothingWithoutXen) {
   if (std::filesystem::exists("/proc/xen/capabilities")) GTEST_SKIP() << "this machine is a guest of Xen";
   EXPECT_EQ(LogOf([] { EXPECT_EQ(TOSSpecific::GetRunningTypeOnXen(), 2); }), std::vector<std::string>{});
 }
@@ -350,7 +350,7 @@ TEST(LaunchCommandShellTest, RunsTheShellAndReturnsItsStatus) {
   EXPECT_EQ(ReadFile(dir.Path("output")), "typed\n");
 }
 
-TEST(ExpandCommandLineWildcardsTest, HandsBothOnUnchanged) {
+TEST(ExpandCommandLineWildcardsTest, ReturnsBothUnchanged) {
   char program[] = "program", pattern[] = "*.h";
   char* arguments[] = {program, pattern, nullptr};
   int count = 0;

@@ -20,13 +20,7 @@ namespace fs = std::filesystem;
 using TEntries = std::vector<std::string>;
 using TNames = std::vector<std::string>;
 
-std::string TextOf(std::size_t size) {
-  std::string text(size, ' ');
-  for (std::size_t i = 0; i < size; ++i) text[i] = static_cast<char>(i * 31 + i / 256);
-  return text;
-}
-
-// A directory that everybody may use, for what a child does as another user.
+// A directory that every user may use, for children that run as another user.
 class FileCopyTest : public testing::Test {
 protected:
   FileCopyTest() { fs::permissions(fDir.Path(), fs::perms::all); }
@@ -109,7 +103,7 @@ TEST_F(FileCopyTest, AFileCopiedOntoItselfStaysAsItWas) {
 }
 
 TEST_F(FileCopyTest, PseudoFilesAndDevicesAreCopied) {
-  TOSSpecific::FileCopy("/proc/version", fDir.Path("version"));  // of size 0, it says
+  TOSSpecific::FileCopy("/proc/version", fDir.Path("version"));  // reports a size of 0
   EXPECT_EQ(ReadFile(fDir.Path("version")), ReadFile("/proc/version"));
   WriteFile(fDir.Path("source"), TextOf(2000000));
   EXPECT_NO_THROW(TOSSpecific::FileCopy(fDir.Path("source"), "/dev/null"));
@@ -155,7 +149,7 @@ TEST_F(FileCopyTest, CopyThrowsWhenAnEndCannotBeOpened) {
   EXPECT_EQ(copyUnprivileged("open", "new"), "copied");
 }
 
-TEST_F(FileCopyTest, CopyToAFullDiskThrowsAndLeavesWhatFitted) {
+TEST_F(FileCopyTest, CopyToAFullDiskThrowsAndLeavesThePartThatFitted) {
   NEEDS(MayMount(), "leave to mount a file system");
   for (std::size_t const size : {200000u, 2000000u}) {
     SCOPED_TRACE(size);
@@ -192,7 +186,7 @@ TEST_F(FileCopyTest, ALastChunkOfWhichOnlyAPartFittedIsACopy) {
   }
 }
 
-TEST_F(FileCopyTest, CopyBeyondTheLargestSizeOfAFileThrowsAndLeavesWhatFitted) {
+TEST_F(FileCopyTest, CopyBeyondTheFileSizeLimitThrowsAndLeavesThePartThatFitted) {
   for (std::size_t const size : {200000u, 2000000u}) {
     SCOPED_TRACE(size);
     WriteFile(fDir.Path("source"), TextOf(size));
@@ -252,7 +246,7 @@ TEST_F(DirCopyTest, ATrailingSeparatorMakesNoDifference) {
     }
 }
 
-TEST_F(DirCopyTest, CopiesIntoADirectoryThatIsThere) {
+TEST_F(DirCopyTest, CopiesIntoAnExistingDirectory) {
   fs::create_directories(fDir.Path("to/below"));
   WriteFile(fDir.Path("to/own"), "own");
   WriteFile(fDir.Path("to/a"), "longer than file a");
@@ -293,7 +287,7 @@ TEST_F(DirCopyTest, ThrowsWhenADirectoryCannotBeOpened) {
   EXPECT_EQ(OpenDescriptors(), before);
 }
 
-TEST_F(DirCopyTest, WhatCreateDirAndFileCopyThrowPassesThrough) {
+TEST_F(DirCopyTest, ExceptionsOfCreateDirAndFileCopyPassThrough) {
   int const before = OpenDescriptors();
   WriteFile(fDir.Path("file"), "");
   EXPECT_STATUS(TOSSpecific::DirCopy(fDir.Path("from"), fDir.Path("file"), true), kZEPStatusDirectoryAlreadyExists);
@@ -311,7 +305,7 @@ TEST_F(DirCopyTest, WhatCreateDirAndFileCopyThrowPassesThrough) {
             "threw kZEPStatusAccessDenied");
 }
 
-TEST_F(DirCopyTest, WhatWasCopiedBeforeAFailureStays) {
+TEST_F(DirCopyTest, FilesCopiedBeforeAFailureStay) {
   fs::create_directory(fDir.Path("one"));
   for (char const* name : {"a", "b", "c"}) WriteFile(fDir.Path("one/") + name, name);
   TEntries const names = TOSSpecific::ListDir(fDir.Path("one"));

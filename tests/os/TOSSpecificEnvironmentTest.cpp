@@ -42,7 +42,7 @@ TEST(GetCurrentDirTest, APathOf1023BytesIsTheLongest) {
   EXPECT_EQ(currentDirOfLength(3000), "threw kZEPStatusFail");
 }
 
-TEST(GetCurrentDirTest, ADirectoryThatIsGoneThrows) {
+TEST(GetCurrentDirTest, ADeletedDirectoryThrows) {
   TTempDir const dir;
   EXPECT_EQ(InChild([&] {
               fs::create_directory(dir.Path("gone"));

@@ -106,7 +106,7 @@ TEST_F(TOSSpecificFilesTest, CreateDirGivesAllPermissionsLessTheUmask) {
   }
 }
 
-TEST_F(TOSSpecificFilesTest, CreateDirThrowsWhatStoodInItsWay) {
+TEST_F(TOSSpecificFilesTest, CreateDirThrowsTheStatusOfItsFailure) {
   WriteFile(fDir.Path("file"), "");
   fs::create_directory(fDir.Path("dir"));
   fs::create_symlink("nowhere", fDir.Path("dangling"));
@@ -192,7 +192,7 @@ TEST_F(TOSSpecificFilesTest, OEMBuildIsTheOneWithTheReadmeBelowTheWorkingDirecto
   fs::current_path(old);
 }
 
-// A directory that everybody may use, for what a child does as another user.
+// A directory that every user may use, for children that run as another user.
 class FilesTest : public testing::Test {
 protected:
   FilesTest() { fs::permissions(fDir.Path(), fs::perms::all); }
@@ -214,7 +214,7 @@ TEST_F(FilesTest, SizeIsThatOfTheFile) {
   EXPECT_EQ(TOSSpecific::GetFileSize("/dev/null"), 0);
 }
 
-TEST_F(FilesTest, WhatIsNoFileHasNoSize) {
+TEST_F(FilesTest, OnlyAFileHasASize) {
   fs::create_symlink("nowhere", fDir.Path("dangling"));
   for (std::string const& path : {fDir.Path("missing"), fDir.Path(), fDir.Path("dangling"), std::string()})
     EXPECT_STATUS(TOSSpecific::GetFileSize(path), kZEPStatusFileNotFound) << path;
@@ -241,7 +241,7 @@ TEST_F(FilesTest, ListIsInTheOrderOfTheSystem) {
   EXPECT_EQ(TOSSpecific::ListDir(fDir.Path()), expected);
 }
 
-TEST_F(FilesTest, WhatIsNoDirectoryCannotBeListed) {
+TEST_F(FilesTest, OnlyADirectoryCanBeListed) {
   int const before = OpenDescriptors();
   WriteFile(fDir.Path("file"), "");
   for (std::string const& path : {fDir.Path("missing"), fDir.Path("file"), std::string()})
@@ -262,7 +262,7 @@ TEST_F(FilesTest, FindFileReturnsTheLinesOfFind) {
   EXPECT_EQ(LogOf([&] { TOSSpecific::FindFile(fDir.Path("tree")); }), (TEntries{"[Debug] SpawnProcess: process find"}));
 }
 
-TEST_F(FilesTest, FindFileHandsOnWhatFindPrintsLineByLine) {
+TEST_F(FilesTest, FindFileReturnsTheOutputOfFindLineByLine) {
   WriteFile(fDir.Path("find"), "#!/bin/sh\n[ $# = 1 ] && printf \"$1\"\n");
   fs::permissions(fDir.Path("find"), fs::perms::all);
   TEnvironmentGuard const path("PATH", (fDir.Path() + ":/usr/bin:/bin").c_str());
@@ -282,7 +282,7 @@ TEST_F(FilesTest, FindFileHandsOnWhatFindPrintsLineByLine) {
   for (TRow const& row : rows) EXPECT_EQ(TOSSpecific::FindFile(row.output), row.lines) << row.output;
 }
 
-TEST_F(FilesTest, FindsComplaintIsALineAsWell) {
+TEST_F(FilesTest, AnErrorMessageOfFindIsALineAsWell) {
   TNames const lines = TOSSpecific::FindFile(fDir.Path("missing"));
   ASSERT_EQ(lines.size(), 1u);
   EXPECT_NE(lines[0].find("No such file or directory"), std::string::npos) << lines[0];
@@ -296,14 +296,14 @@ TEST_F(FilesTest, DeleteFileIsAlwaysTrue) {
             (TEntries{"[Debug] Entering TOSSpecific::deleteFile, path=" + fDir.Path("file"),
                       "[Debug] Exiting TOSSpecific::deleteFile"}));
   EXPECT_FALSE(fs::exists(fDir.Path("file")));
-  EXPECT_TRUE(TOSSpecific::deleteFile(fDir.Path("file")));  // is gone already
+  EXPECT_TRUE(TOSSpecific::deleteFile(fDir.Path("file")));  // is deleted already
   testing::internal::CaptureStderr();
   EXPECT_TRUE(TOSSpecific::deleteFile(fDir.Path()));  // a directory
   EXPECT_NE(testing::internal::GetCapturedStderr(), "");
   EXPECT_TRUE(fs::exists(fDir.Path()));
 }
 
-TEST_F(FilesTest, DeleteFileTakesShellPatternsAndQuotesNothing) {
+TEST_F(FilesTest, DeleteFileAcceptsShellPatternsAndQuotesNothing) {
   for (char const* name : {"a1", "a2", "b1", "two", "words"}) WriteFile(fDir.Path(name), "");
   TOSSpecific::deleteFile(fDir.Path("a*"));
   EXPECT_THAT(TOSSpecific::ListDir(fDir.Path()), testing::UnorderedElementsAre("b1", "two", "words"));
@@ -357,7 +357,7 @@ TEST_F(FilesTest, CreateFileThatCannotBeOpenedIsFalseWithTheReasonAtDebug) {
       (TEntries{"[Debug] Entering TOSSpecific::createFile, path=" + fDir.Path(), "[Debug] Unable to create file, errno=21"}));
 }
 
-TEST_F(FilesTest, CreateFileDoesNotAskWhetherTheContentsArrived) {
+TEST_F(FilesTest, CreateFileIgnoresTheResultOfItsWrite) {
   EXPECT_TRUE(TOSSpecific::createFile("/dev/full", "no room for this"));
   NEEDS(MayMount(), "leave to mount a file system");
   TTempDir const small;
@@ -393,7 +393,7 @@ TEST_F(FilesTest, StreamThatIsOpenIsClosedFirst) {
   EXPECT_EQ(ReadFile(fDir.Path("second")), "second");
 }
 
-TEST_F(FilesTest, StreamThatFailedBeforeOpensAllTheSame) {
+TEST_F(FilesTest, AFailedStreamCanBeOpenedAgain) {
   std::ofstream stream;
   EXPECT_STATUS(TOSSpecific::OpenOutputFileStream(stream, fDir.Path("missing/file")), kZEPStatusFileSystemError);
   EXPECT_TRUE(stream.fail());
@@ -424,7 +424,7 @@ TEST_F(FilesTest, ReasonOfAStreamThatCannotBeOpenedTravelsWithTheFailure) {
   EXPECT_EQ(ReasonOf([&] { TOSSpecific::OpenOutputFileStream(stream, path); }), "Failed to open output file: " + path);
 }
 
-TEST_F(FilesTest, StreamThatThrowsByItselfFailsWithTheStatusAndKeepsItsMask) {
+TEST_F(FilesTest, AThrowingStreamFailsWithTheStatusAndKeepsItsMask) {
   constexpr std::ios::iostate kMasks[] = {std::ios::failbit, std::ios::badbit, std::ios::failbit | std::ios::badbit,
                                           std::ios::failbit | std::ios::badbit | std::ios::eofbit};
   for (std::ios::iostate const mask : kMasks) {
@@ -444,7 +444,7 @@ TEST_F(FilesTest, StreamThatThrowsByItselfFailsWithTheStatusAndKeepsItsMask) {
   }
 }
 
-TEST_F(FilesTest, StreamThatThrowsByItselfIsClosedFirstWhateverBecomesOfItsOldFile) {
+TEST_F(FilesTest, AThrowingStreamIsClosedFirstEvenWhenItsOldFileFails) {
   std::ofstream stream("/dev/full");
   stream.exceptions(std::ios::failbit | std::ios::badbit);
   stream << "never written";  // which closing the file finds out

@@ -41,7 +41,7 @@ protected:
     return settings;
   }
 
-  // What the terminal shows within that time and the moment after, its echo above all.
+  // The text that the terminal shows within that time and shortly after, above all its echo.
   std::string Shown(int milliseconds = 100) const {
     std::string shown;
     for (pollfd keyboard{fKeyboard.get(), POLLIN, 0}; ::poll(&keyboard, 1, milliseconds) > 0; milliseconds = 100) {
@@ -76,7 +76,7 @@ TEST_F(KeyboardTest, AKeyWaitsOnceItIsTyped) {
   EXPECT_FALSE(TOSSpecific::IsKeyWaiting());
 }
 
-TEST_F(KeyboardTest, EveryKeyTypedAheadIsHandedOnByItself) {
+TEST_F(KeyboardTest, KeysTypedAheadAreReturnedOneByOne) {
   Type("abc");
   for (int const key : {'a', 'b', 'c'}) {
     EXPECT_TRUE(TOSSpecific::IsKeyWaiting());
@@ -85,7 +85,7 @@ TEST_F(KeyboardTest, EveryKeyTypedAheadIsHandedOnByItself) {
   EXPECT_FALSE(TOSSpecific::IsKeyWaiting());
 }
 
-TEST_F(KeyboardTest, AskingForAKeyNeverBlocks) {
+TEST_F(KeyboardTest, CheckingForAKeyNeverBlocks) {
   auto const start = TClock::now();
   for (int i = 0; i < 100; ++i) EXPECT_FALSE(TOSSpecific::IsKeyWaiting());
   EXPECT_LT(TClock::now() - start, 5s);
@@ -116,7 +116,7 @@ TEST_F(KeyboardTest, EveryKeyIsACharacterSoAreThoseOfSignalsAndOfTheEnd) {
   }
 }
 
-TEST_F(KeyboardTest, ACharacterIsWaitedForWhateverTheTerminalsMinimumIs) {
+TEST_F(KeyboardTest, ACharacterIsAwaitedWithAnyMinimumOfTheTerminal) {
   for (cc_t const minimum : {0, 5}) {
     termios settings = Settings();
     settings.c_cc[VMIN] = minimum;
@@ -134,7 +134,7 @@ TEST_F(KeyboardTest, ACharacterIsWaitedForWhateverTheTerminalsMinimumIs) {
   }
 }
 
-TEST_F(KeyboardTest, SettingsComeBackAsTheyWere) {
+TEST_F(KeyboardTest, SettingsAreRestored) {
   termios settings = Settings();
   settings.c_lflag = ISIG | ICANON | ECHOK | NOFLSH;
   settings.c_iflag = IXON | BRKINT;
@@ -151,7 +151,7 @@ TEST_F(KeyboardTest, SettingsComeBackAsTheyWere) {
   EXPECT_TRUE(Settings() == settings);
 }
 
-TEST_F(KeyboardTest, AfterwardsTheTerminalHandsOnLinesAgain) {
+TEST_F(KeyboardTest, AfterwardsTheTerminalReturnsLinesAgain) {
   TOSSpecific::IsKeyWaiting();
   Type("line\n");
   EXPECT_EQ(Shown(5000), "line\r\n");  // echoed
@@ -166,7 +166,7 @@ TEST_F(KeyboardTest, AHangUpIsTheEnd) {
   EXPECT_EQ(TOSSpecific::GetKeyboardChar(), EOF);
 }
 
-// ---- Standard input that is no terminal ----
+// ---- Standard input that is not a terminal ----
 
 TEST(NoKeyboardTest, APipeWorksAsWell) {
   int ends[2];
@@ -192,7 +192,7 @@ TEST(NoKeyboardTest, TheNullDeviceIsAtItsEnd) {
   EXPECT_EQ(TOSSpecific::GetKeyboardChar(), EOF);
 }
 
-TEST(NoKeyboardTest, AKeyWaitsAlsoWhereSelectFails) {
+TEST(NoKeyboardTest, AKeyWaitsWhenSelectFails) {
   EXPECT_EQ(InChild([] {
               ::close(0);
               return std::string(TOSSpecific::IsKeyWaiting() ? "waiting" : "not waiting") +

@@ -2,6 +2,7 @@
 #include "TOSSpecific.h"
 
 #include "TLogger.h"
+#include "tests/LogOf.h"
 #include "tests/SmbiosTables.h"
 #include "tests/os/FakeClock.h"
 
@@ -16,7 +17,7 @@
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-// A stand-in for the system log, which writes down what is called. The library finds these before those of the C library.
+// A stand-in for the system log, which records its calls. The library finds these before those of the C library.
 
 namespace {
 
@@ -102,7 +103,7 @@ TEST_F(TOSSpecificLogTest, LogSELEventDoesNotUseItsLastArgument) {
   }
 }
 
-TEST_F(TOSSpecificLogTest, SysLogEntryPassesTheWholeLineWithItsNewline) {
+TEST_F(TOSSpecificLogTest, SysLogEntryPassesTheCompleteLineWithItsNewline) {
   struct {
     int severity, priority;
     char const* line;
@@ -122,7 +123,7 @@ TEST_F(TOSSpecificLogTest, SysLogEntryPassesTheWholeLineWithItsNewline) {
   }
 }
 
-TEST_F(TOSSpecificLogTest, SysLogEntryAsksForNoThresholdAndRecordsNothing) {
+TEST_F(TOSSpecificLogTest, SysLogEntryIgnoresTheThresholdAndRecordsNothing) {
   TLogger::SetLogThreshold(Severity(-1));
   for (int severity : {0, 1, 2, 3, 4}) TLogger().SysLogEntry(Severity(severity), "text");
   EXPECT_EQ(gCalls.size(), 15u);
@@ -244,7 +245,7 @@ TEST_F(SetDebugLevelTest, OnlyTheLevels0To4AreSet) {
   }
 }
 
-TEST_F(SetDebugLevelTest, AFileThatCannotBeMadeGoesUnnoticed) {
+TEST_F(SetDebugLevelTest, AFileThatCannotBeMadeIsNotReported) {
   EXPECT_TRUE(SetDebugLevel(1, fDir.Path("absent/zep_")));
   EXPECT_EQ(Threshold(), ILogger::kLogWarning);
   EXPECT_FALSE(SetDebugLevel(7, fDir.Path("absent/zep_")));
@@ -268,7 +269,7 @@ TEST_F(SetDebugLevelTest, ReadsTheMachineTypeBeforeTheThresholdChanges) {
                           "[Debug] getMachineType() completed."));
 }
 
-TEST_F(SetDebugLevelTest, APathThatIsGivenCountsInBothVariants) {
+TEST_F(SetDebugLevelTest, AGivenPathIsUsedInBothVariants) {
   TFakeClock const clock(k3March2024);
   std::filesystem::create_directory("docs");
   WriteFile("docs/oem_zep_preboot_readme.txt", "");

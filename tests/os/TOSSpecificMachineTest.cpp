@@ -174,7 +174,7 @@ TEST_F(TOSSpecificMachineTest, TheMachineTypeIsThatOfTheBiosBuildWhereTheTableKn
   };
   TRow const rows[] = {
       {"-[QSE118B-1.30]-", "5678"}, {"-[118BQS-1.30]-", "5678"}, {"-[QXQS-1.30]-", "5678"},
-      {"-[ABE118B-1.30]-", "1234"}, {"-[ABE-QS]-", "1234"},  // only the part in front of the hyphen counts
+      {"-[ABE118B-1.30]-", "1234"}, {"-[ABE-QS]-", "1234"},  // only the part before the hyphen counts
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.version);
@@ -184,9 +184,9 @@ TEST_F(TOSSpecificMachineTest, TheMachineTypeIsThatOfTheBiosBuildWhereTheTableKn
   }
 }
 
-// ---- What is logged, all at debug severity and in this order ----
+// ---- The log entries, all at debug severity and in this order ----
 
-TEST_F(TOSSpecificMachineTest, GetMachineTypeLogsWhatItFound) {
+TEST_F(TOSSpecificMachineTest, GetMachineTypeLogsItsResult) {
   UseTable(RealTable("full"));
   EXPECT_THAT(LogOf([] { TOSSpecific::GetMachineType(); }),
               ElementsAre("[Debug] getMachineType() entered.", "[Debug] Machine type detected: 1234",
@@ -337,7 +337,7 @@ TEST(GetBIDStringTest, CopiesTheStringOfThatNumber) {
   }
 }
 
-TEST(GetBIDStringTest, ReadsNothingBehindTheLength) {
+TEST(GetBIDStringTest, ReadsNothingAfterTheLength) {
   for (std::string const& set : {"one\0three\0"s, "one"s, "\0\0\0"s, "x\0"s})
     for (int number = -1; number < 5; ++number) {
       std::unique_ptr<char[]> const exact(new char[set.size()]);
@@ -385,7 +385,7 @@ std::string const kGotType1 = "smBiosGetFirst(its handle, 1, cleared buffer, 102
 std::string const kGotType0 = "smBiosGetFirst(its handle, 0, cleared buffer, 4096)";
 std::string const kClosed = "smBiosClose(its handle)";
 
-TEST_F(SmbiosStandInTest, TheLoadersSearchPathComesFirst) {
+TEST_F(SmbiosStandInTest, TheLoadersSearchPathIsUsedFirst) {
   TProbeRun const run = Run("SN", StructureFile(SystemInformation("Server Q100 -[1234AB7]-", "KQ12345")));
   EXPECT_EQ(run.result, "KQ12345");
   EXPECT_THAT(run.calls, ElementsAre(kLoaded, kGotType1, kClosed));
@@ -479,7 +479,7 @@ TEST_F(SmbiosStandInTest, NoMoreItemsOfType0StopsAndCloses) {
   EXPECT_THAT(run.calls, ElementsAre(kLoaded, kGotType0, kClosed));
 }
 
-TEST_F(SmbiosStandInTest, AnyOtherStatusOfType0GoesOnWithTheBuffer) {
+TEST_F(SmbiosStandInTest, AnyOtherStatusOfType0UsesTheBuffer) {
   TProbeRun const run = Run("GetBiosID", StructureFile(BiosInformation("-[QSE118B-1.10]-")) + "STANDIN_GET_STATUS=1");
   EXPECT_EQ(run.result, "QS");
 }
@@ -526,7 +526,7 @@ TEST_F(SmbiosStandInTest, ALibraryWithoutOneOfTheFunctionsIsNotFound) {
   }
 }
 
-TEST_F(SmbiosStandInTest, AFileThatIsNoLibraryCannotBeOpened) {
+TEST_F(SmbiosStandInTest, AFileThatIsNotALibraryCannotBeOpened) {
   WriteFile(fDir.Path("libsmbios.so"), "not a library");
   TProbeRun const run = Run("GetBiosID", "", fDir.Path());
   EXPECT_EQ(run.result, "00");

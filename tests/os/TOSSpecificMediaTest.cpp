@@ -30,7 +30,7 @@ std::string Joined(TLines const& lines) {
 
 std::string const kKeyIsMounted = "mount | grep \"/mnt/key type\" >/dev/null";
 std::string const kFloppyIsMounted = "mount | grep \"/mnt/floppy type\" >/dev/null";
-constexpr int kFails = 1 << 8;  // what system() returns for a command that exits with 1
+constexpr int kFails = 1 << 8;  // the result of system() for a command that exits with 1
 
 TEST(MountDeviceTest, FloppyDevicesHaveTheirOwnMountPoint) {
   struct TRow {
@@ -55,7 +55,7 @@ TEST(MountDeviceTest, FloppyDevicesHaveTheirOwnMountPoint) {
   }
 }
 
-TEST(MountDeviceTest, WhatIsMountedThereAlreadyStaysAndWillDo) {
+TEST(MountDeviceTest, AnExistingMountStaysAndIsAccepted) {
   TFakeShell const shell({});
   EXPECT_EQ(TOSSpecific::MountDevice("/dev/sdb"), "/mnt/key");
   EXPECT_EQ(TOSSpecific::MountDevice("/dev/sdc"), "/mnt/key");
@@ -80,7 +80,7 @@ TEST(MountDeviceTest, OnlyAResultOfZeroIsASuccess) {
   }
 }
 
-TEST(MountDeviceTest, ANameIsPutIntoTheCommandAsItIs) {
+TEST(MountDeviceTest, ANameIsPutIntoTheCommandUnquoted) {
   TFakeShell const shell({}, kFails);
   EXPECT_STATUS(TOSSpecific::MountDevice("-o ro \"/dev/x y\";"), kZEPStatusFileSystemError);
   EXPECT_THAT(shell.Commands(), ElementsAre(kKeyIsMounted, "mount -o ro \"/dev/x y\"; /mnt/key 2>/dev/null",
@@ -120,7 +120,7 @@ TEST(UnmountDeviceTest, AnyResultButZeroThrows) {
 
 class StandInTest : public testing::Test {
 protected:
-  // A script of the shell that writes down how it was called, and then does as told.
+  // A shell script that records its call, and then does what the test wants.
   void Add(std::string const& name, std::string const& body) {
     WriteFile(fDir.Path(name), "#!/bin/sh\necho \"" + name + " $*\" >> " + fDir.Path("calls") + "\n" + body + "\n");
     fs::permissions(fDir.Path(name), fs::perms::all);
@@ -137,7 +137,7 @@ protected:
   TEnvironmentGuard const fPath{"PATH", (fDir.Path() + ":/usr/bin:/bin").c_str()};
 };
 
-TEST_F(StandInTest, MountIsAskedAndThenMounts) {
+TEST_F(StandInTest, MountIsQueriedAndThenMounts) {
   Add("mount", "if test $# = 0; then echo '/dev/sda1 on / type ext4 (rw)'; else echo complaint >&2; fi");
   EXPECT_EQ(TOSSpecific::MountDevice("/dev/sdb"), "/mnt/key");
   EXPECT_THAT(Calls(), ElementsAre("mount ", "mount /dev/sdb /mnt/key"));
@@ -154,7 +154,7 @@ TEST_F(StandInTest, AMountedKeyIsFoundInTheListOfMounts) {
       {"/dev/fd0 on /mnt/floppy type vfat (rw)", "/dev/fd0", true},
       {"/dev/fd0 on /mnt/floppy type vfat (rw)", "/dev/sdc", false},
       {"/dev/sdb1 on /mnt/key2 type vfat (rw)", "/dev/sdc", false},
-      {"/dev/sdb1 on /media/mnt/key type vfat (rw)", "/dev/sdc", true},  // the end of a longer path will do as well
+      {"/dev/sdb1 on /media/mnt/key type vfat (rw)", "/dev/sdc", true},  // the end of a longer path is accepted as well
       {"/dev/sdb1 on /mnt/key", "/dev/sdc", false},
   };
   for (TRow const& row : rows) {
@@ -171,7 +171,7 @@ TEST_F(StandInTest, AMountedKeyIsFoundInTheListOfMounts) {
   }
 }
 
-TEST_F(StandInTest, WhatTheCommandsComplainOfIsNotSeen) {
+TEST_F(StandInTest, ErrorMessagesOfTheCommandsAreSuppressed) {
   Add("mount", "echo complaint >&2; exit 1");
   Add("umount", "echo complaint >&2; exit 1");
   Add("grep", "exit 1");
@@ -254,13 +254,13 @@ TEST_F(StandInTest, ABlockWithoutDeviceFileGivesNothing) {
   EXPECT_THAT(VirtualDevices(1, false), IsEmpty());
 }
 
-TEST_F(StandInTest, AKindThatIsNoneRunsNothing) {
+TEST_F(StandInTest, AnUnknownKindRunsNothing) {
   Add("hwinfo", "cat " + PathOfSample("disk.txt"));
   for (int const kind : {-1, 4, 5, 1000, INT_MIN, INT_MAX}) EXPECT_THAT(VirtualDevices(kind, true), IsEmpty()) << kind;
   EXPECT_THAT(Calls(), IsEmpty());
 }
 
-TEST_F(StandInTest, WhatHwinfoPrintedCountsWhateverItsEnd) {
+TEST_F(StandInTest, TheOutputOfHwinfoCountsWhateverItsResult) {
   Add("hwinfo", "cat " + PathOfSample("disk.txt") + "; exit 3");
   EXPECT_THAT(VirtualDevices(0, false), ElementsAre("/dev/sdc"));
   Add("hwinfo", "cat " + PathOfSample("disk.txt") + " >&2; kill -9 $$");
@@ -278,7 +278,7 @@ TEST_F(StandInTest, OnlyTheSpawningIsLogged) {
   EXPECT_THAT(LogOf([] { VirtualDevices(0, true); }), ElementsAre("[Debug] SpawnProcess: process hwinfo"));
 }
 
-TEST_F(StandInTest, AHangingHwinfoIsLeftAloneAfterThreeHundredSecondsOfSilence) {
+TEST_F(StandInTest, AHangingHwinfoIsAbandonedAfterThreeHundredSecondsOfSilence) {
   Add("hwinfo", "echo $$ > " + fDir.Path("pid") + "; cat " + PathOfSample("disk.txt") + "; exec sleep 60");
   TFastSelect const time;
   TLines devices;
@@ -316,7 +316,7 @@ private:
   TFakeClass& fClass;
 };
 
-// For use in a child: covers the places that are looked at with file systems of the child's own, all of them empty.
+// For use in a child: covers the paths that are read with empty file systems of the child's own.
 class TFakeMachine {
 public:
   TFakeMachine() {
@@ -325,7 +325,7 @@ public:
     fs::create_directory("/mnt/key");
   }
 
-  // A disk's node, and what sysfs has of it; a USB device above it where `usb` says one, "busnum/devnum".
+  // A disk's node and its entry in sysfs, with the USB device `usb` ("busnum/devnum") above it, if any.
   void AddDisk(std::string const& name, std::string const& address, std::string const& usb) {
     AddNode(name, address);
     std::string const place = "/sys/class/block/devices/" + name;
@@ -451,7 +451,7 @@ TEST(EnumerateRemovableMediaTest, EveryNumberOfTheAddressCounts) {
             "/dev/sdb|Maker Stick|/mnt/key\n/dev/sdz|Maker Stick|/mnt/key\n");
 }
 
-TEST(EnumerateRemovableMediaTest, NodesAreAskedInTheOrderOfTheirLetters) {
+TEST(EnumerateRemovableMediaTest, NodesAreQueriedInTheOrderOfTheirLetters) {
   NEEDS_MOUNTS();
   std::string expected;
   for (char letter = 'a'; letter <= 'z'; ++letter) {
@@ -524,11 +524,11 @@ TEST(EnumerateRemovableMediaTest, AListThatCannotBeReadIsNone) {
             "/dev/sdb|Maker Stick|/mnt/key\n");
 }
 
-TEST(EnumerateRemovableMediaTest, OnlyWhatTheListHoldsIsAUsbDisk) {
+TEST(EnumerateRemovableMediaTest, OnlyADiskInTheListIsAUsbDisk) {
   NEEDS_MOUNTS();
   std::string const list = "T:  Bus=02 Lev=01 Dev#=  2\nS:  Product=Key\n";
   struct TRow {
-    std::string usb;   // what sysfs shows above the disk; "-" when it does not know the disk at all
+    std::string usb;   // the USB device above the disk in sysfs; "-" when sysfs does not list the disk
     std::string list;  // empty: there is none
     bool isFound;
   };
@@ -538,7 +538,7 @@ TEST(EnumerateRemovableMediaTest, OnlyWhatTheListHoldsIsAUsbDisk) {
       {"3/2", list, false},
       {"", list, false},
       {"", list + "USB", false},
-      {"2/2", "", true},  // sysfs alone tells
+      {"2/2", "", true},  // sysfs alone decides
       {"", "", false},
       {"-", list, false},
       {"-", list + "S:  Product=USB Key\n", true},
@@ -598,7 +598,7 @@ TEST(EnumerateRemovableMediaTest, OnlyDirectAccessDevicesAreDisks) {
             "/dev/sdb|Maker the one|/mnt/key\n");
 }
 
-TEST(EnumerateRemovableMediaTest, WhatIsMissingOrNullIsEmpty) {
+TEST(EnumerateRemovableMediaTest, AMissingOrNullPropertyIsEmpty) {
   NEEDS_MOUNTS();
   EXPECT_EQ(InChild([] {
               TFakeMachine const machine;
@@ -618,7 +618,7 @@ TEST(EnumerateRemovableMediaTest, WhatIsMissingOrNullIsEmpty) {
             "[Debug] No mapping found for  -  - \n");
 }
 
-TEST(EnumerateRemovableMediaTest, WhatTheNamespaceThrowsIsPassedOn) {
+TEST(EnumerateRemovableMediaTest, ExceptionsOfTheNamespacePassThrough) {
   EXPECT_STATUS(TOSSpecific::EnumerateRemovableMedia(boost::make_shared<TFakeNamespace>()), kZEPStatusNotFound);
   TScsiNamespace ns;
   auto const disk = ns.AddDisk("1:0:0:0");

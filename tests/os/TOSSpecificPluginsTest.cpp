@@ -66,7 +66,7 @@ TEST_F(FindPluginsTest, SortsByBytes) {
   EXPECT_THAT(TOSSpecific::FindPlugins(fDir.Path()), ElementsAre(space, a, second, z, lower, high));
 }
 
-TEST_F(FindPluginsTest, TheEndingMayStandAnywhereInTheName) {
+TEST_F(FindPluginsTest, TheEndingMayBeAnywhereInTheName) {
   std::string const backup = Make("A/x.pi.so.bak"), bare = Make("A/.pi.so"), twice = Make("A/y.pi.so.pi.so");
   for (char const* name :
        {"A/libA.nsp.so", "A/libA.pi.s", "A/libApi.so", "A/libA.pi-so", "A/libA.PI.so", "A/libA.pi.properties.xml"})
@@ -88,12 +88,12 @@ TEST_F(FindPluginsTest, FollowsALinkToADirectoryAndPassesOverADeadOne) {
   EXPECT_THAT(TOSSpecific::FindPlugins(fDir.Path()), ElementsAre(fDir.Path("link/libA.pi.so")));
 }
 
-TEST_F(FindPluginsTest, TakesADirectoryWhoseNameBeginsWithADot) {
+TEST_F(FindPluginsTest, FindsADirectoryWhoseNameBeginsWithADot) {
   std::string const hidden = Make(".hidden/libA.pi.so"), dots = Make(".../libA.pi.so");
   EXPECT_THAT(TOSSpecific::FindPlugins(fDir.Path()), ElementsAre(dots, hidden));
 }
 
-TEST_F(FindPluginsTest, FindsTheKindThatItIsAskedFor) {
+TEST_F(FindPluginsTest, FindsTheRequestedKind) {
   std::string const pi = Make("A/libA.pi.so"), cmpi = Make("A/libA.cmpi.so"), nsp = Make("A/libA.nsp.so");
   EXPECT_THAT(TOSSpecific::FindPlugins(fDir.Path(), "pi"), ElementsAre(pi));
   EXPECT_THAT(TOSSpecific::FindPlugins(fDir.Path(), "cmpi"), ElementsAre(cmpi));
@@ -101,7 +101,7 @@ TEST_F(FindPluginsTest, FindsTheKindThatItIsAskedFor) {
   EXPECT_THAT(TOSSpecific::FindPlugins(fDir.Path(), "nsc"), IsEmpty());
 }
 
-TEST_F(FindPluginsTest, JoinsTheRootWithASeparatorAsItIs) {
+TEST_F(FindPluginsTest, JoinsTheUnchangedRootWithASeparator) {
   Make("A/libA.pi.so");
   EXPECT_THAT(TOSSpecific::FindPlugins(fDir.Path() + "/"), ElementsAre(fDir.Path() + "//A/libA.pi.so"));
 }
@@ -128,7 +128,7 @@ TEST_F(FindPluginsTest, ASubdirectoryThatCannotBeOpenedIsAFileSystemError) {
 
 // ---- Companion documents ----
 
-TEST(CompanionPathTest, StandsBesideThePluginWithoutTheLibraryPrefix) {
+TEST(CompanionPathTest, IsBesideThePluginWithoutTheLibraryPrefix) {
   struct {
     char const *plugin, *kind, *stem;
   } const rows[] = {
@@ -142,7 +142,7 @@ TEST(CompanionPathTest, StandsBesideThePluginWithoutTheLibraryPrefix) {
       {"/opt/p/libDisk.cmpi.so", "cmpi", "/opt/p/libDisk"},  // this kind keeps it
       {"/opt/p/Disk.cmpi.so", "cmpi", "/opt/p/Disk"},
       {"/opt/p/libDisk.CMPI.so", "CMPI", "/opt/p/Disk"},
-      {"li.pi.so/blib.pi.so", "pi", nullptr},  // "lib" behind the part that is kept
+      {"li.pi.so/blib.pi.so", "pi", nullptr},  // "lib" after the part that is kept
       {"xx.pi.so/lib", "pi", nullptr},
       {"lib.pi.so", "pi", ""},
   };
@@ -177,7 +177,7 @@ TEST(CompanionPathTest, WithoutTheEndingOrWithoutTheLibraryPrefixItFails) {
   }
 }
 
-// ---- The root path, and what lies in it: a copy of the core library in a directory of the test's own, used by a program ----
+// ---- The root path and its files: a copy of the core library in a directory of the test's own, used by a program ----
 
 class RootPathTest : public testing::Test {
 protected:
@@ -186,7 +186,7 @@ protected:
   // Copies a plug-in of the test tree into the root path.
   void Install(std::string const& file) { fs::copy_file(kPlugins + file, fDir.Path(file)); }
 
-  // What the program prints that uses the core library of that directory.
+  // The output of the program that uses the core library of that directory.
   static std::vector<std::string> Probe(std::string const& directory, std::string const& arguments) {
     TProgramRun const run = RunProgram("LD_LIBRARY_PATH='" + directory + "' " + kProbe + " " + arguments);
     EXPECT_EQ(run.exitCode, 0);
@@ -202,7 +202,7 @@ TEST_F(RootPathTest, IsTheDirectoryOfTheCoreLibrary) {
   EXPECT_THAT(Probe("root"), ElementsAre(fDir.Path()));
 }
 
-TEST_F(RootPathTest, IsWhatTheDynamicLinkerCallsIt) {
+TEST_F(RootPathTest, IsTheNameThatTheDynamicLinkerUses) {
   fs::create_directory(fDir.Path("link"));
   fs::create_symlink("../libzepcore.so", fDir.Path("link/libzepcore.so"));
   EXPECT_THAT(Probe(fDir.Path("link"), "root"), ElementsAre(fDir.Path("link")));
@@ -289,7 +289,7 @@ TEST_F(RootPathTest, WithoutTheIpmiClientNoControllerAnswers) {
   EXPECT_THAT(Probe("controller"), ElementsAre("[]", "not connected"));
 }
 
-TEST_F(RootPathTest, AnIpmiClientThatComesLaterIsLoadedThen) {
+TEST_F(RootPathTest, AnIpmiClientInstalledLaterIsLoadedThen) {
   if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, whose dlopen looks where the program does: beside the real client";
   EXPECT_THAT(Probe("controller '' " ZEP_IPMI_STANDINS "/whole/libipmiClient.so"),
               ElementsAre("[]", "not connected", testing::_, "connected"));
@@ -353,7 +353,7 @@ TEST_F(RootPathTest, AConsumerLibraryWithoutItsFactoryIsNotFoundAndStaysLoaded) 
                           "the library is loaded"));
 }
 
-TEST_F(RootPathTest, TheFactorysNameBeginsWithTheBaseNameAskedFor) {
+TEST_F(RootPathTest, TheFactorysNameBeginsWithTheRequestedBaseName) {
   fs::copy_file(kPlugins + "libFan.nsc.so", fDir.Path("libRenamed.nsc.so"));
   EXPECT_THAT(Probe("load-nsc Renamed"),
               ElementsAre("threw kZEPStatusNotFound",

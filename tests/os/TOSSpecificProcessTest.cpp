@@ -38,7 +38,7 @@ TRun RunChild(std::string const& name, TArguments const& arguments = {}, int tim
   return run;
 }
 
-// Every child is to be waited for, except where a test says otherwise.
+// Every child must be waited for, unless a test states otherwise.
 class SpawnProcessTest : public testing::Test {
 protected:
   void TearDown() override { EXPECT_FALSE(HasChildren()); }
@@ -56,7 +56,7 @@ void EndChild(std::string const& output) {
 
 // ---- Results and output ----
 
-TEST_F(SpawnProcessTest, TellsOnlyWhetherTheChildExitedWithZero) {
+TEST_F(SpawnProcessTest, ReportsOnlyWhetherTheChildExitedWithZero) {
   struct TRow {
     std::string child;
     TArguments arguments;
@@ -148,7 +148,7 @@ TEST_F(SpawnProcessTest, StandardInputIsTheCallers) {
   EXPECT_EQ(RunChild("EchoesItsInput").output, "typed");
 }
 
-// ---- What is run ----
+// ---- The program ----
 
 TEST_F(SpawnProcessTest, ArgumentZeroAndEnvironmentAreThoseGiven) {
   std::string output;
@@ -181,7 +181,7 @@ TEST_F(SpawnProcessTest, OnlyTheFormWithoutEnvironmentSearchesThePath) {
   EXPECT_EQ(output, "");
 }
 
-TEST_F(SpawnProcessTest, SearchGoesOnAfterADirectoryWithoutTheProgram) {
+TEST_F(SpawnProcessTest, SearchContinuesAfterADirectoryWithoutTheProgram) {
   TTempDir const dir;
   WriteFile(dir.Path("PrintsArguments"), "not executable");
   TEnvironmentGuard const path("PATH", ("/nonexistent:" + dir.Path() + ":" ZEP_CHILDREN_DIR).c_str());
@@ -214,7 +214,7 @@ TEST_F(SpawnProcessTest, AProgramThatCannotBeExecutedIsMinusOneAndNoException) {
   }
 }
 
-TEST_F(SpawnProcessTest, ManyAndLongArgumentsArriveWhole) {
+TEST_F(SpawnProcessTest, ManyAndLongArgumentsArriveComplete) {
   TArguments arguments;
   std::string expected = "[" + Child("PrintsArguments") + "]";
   for (int i = 0; i < 2000; ++i) {
@@ -257,7 +257,7 @@ TEST_F(SpawnProcessTest, CommandLineIsCutAtEverySingleBlank) {
 
 // ---- Messages ----
 
-TEST_F(SpawnProcessTest, LogsWhatItCalls) {
+TEST_F(SpawnProcessTest, LogsTheCall) {
   std::string output;
   EXPECT_EQ(LogOf([&] {
               TOSSpecific::SpawnProcess(Child("PrintsNothing"), {"a", "", "b c"}, "zero", {"A=1", "B=2"}, output, kForEver);
@@ -281,7 +281,7 @@ TEST_F(SpawnProcessTest, AChildEndedByASignalIsLogged) {
 
 // ---- The time-out ----
 
-TEST_F(SpawnProcessTest, TimeoutIsOneOfSilenceAndLeavesTheChildAlive) {
+TEST_F(SpawnProcessTest, TimeoutLimitsSilenceAndLeavesTheChildAlive) {
   TRun run;
   EXPECT_EQ(LogOf([&] { run = RunChild("StaysSilent", {}, 3); }),
             (TEntries{"[Debug] SpawnProcess: process " + Child("StaysSilent"),
@@ -289,7 +289,7 @@ TEST_F(SpawnProcessTest, TimeoutIsOneOfSilenceAndLeavesTheChildAlive) {
   EXPECT_EQ(run.result, -1);
   EXPECT_GE(run.time, 2990ms);
   EXPECT_LT(run.time, 15s);
-  EndChild(run.output);  // what came before the silence stays in the output
+  EndChild(run.output);  // the output before the silence is kept
 }
 
 TEST_F(SpawnProcessTest, TimeoutOfTheFormWithEnvironmentNamesItsPath) {
@@ -399,7 +399,7 @@ TEST_F(SpawnProcessTest, SignalStateOfTheCallerStaysAsItWas) {
     EXPECT_EQ(::sigismember(&after, number), number == SIGUSR2 ? 1 : ::sigismember(&before, number)) << number;
 }
 
-TEST_F(SpawnProcessTest, AChildThatNobodyWaitsForIsAFailureOfWaitpid) {
+TEST_F(SpawnProcessTest, AChildThatCannotBeWaitedForIsAFailureOfWaitpid) {
   TSignalAction const action(SIG_IGN, SIGCHLD);  // the kernel takes the child's status itself
   EXPECT_EQ(
       LogOf([] { EXPECT_EQ(RunChild("ExitsWith3").output, "done\n"); }),
@@ -478,7 +478,7 @@ TEST_F(SpawnProcessTest, NoChildWaitsForThatOfAnotherThread) {
   }  // what timed out
 }
 
-TEST_F(SpawnProcessTest, OutputIsCapturedAlsoWhereTheStandardDescriptorsAreClosed) {
+TEST_F(SpawnProcessTest, OutputIsCapturedEvenWhenTheStandardDescriptorsAreClosed) {
   for (std::vector<int> const& closed : std::vector<std::vector<int>>{{0}, {1}, {2}, {0, 1}, {1, 2}, {0, 1, 2}}) {
     SCOPED_TRACE(testing::PrintToString(closed));
     EXPECT_EQ(InChild([&] {
@@ -647,7 +647,7 @@ void OnStackOf(std::size_t size, std::function<void()> function) {
   ::pthread_join(thread, nullptr);
 }
 
-TEST_F(SpawnProcessTest, AStackOf32KiBWillDo) {
+TEST_F(SpawnProcessTest, AStackOf32KiBIsEnough) {
   if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs stack of its own";
   constexpr std::size_t kLength = 1000000;
   TTempDir const dir;
@@ -664,7 +664,7 @@ TEST_F(SpawnProcessTest, AStackOf32KiBWillDo) {
   EXPECT_TRUE(withEnvironment.output == searched.output);
 }
 
-TEST_F(SpawnProcessTest, ServesManyThreads) {
+TEST_F(SpawnProcessTest, WorksInManyThreads) {
   std::atomic<int> wrong{0};
   std::vector<std::thread> threads;
   for (int i = 0; i < 8; ++i)
@@ -684,9 +684,9 @@ TEST_F(SpawnProcessTest, ServesManyThreads) {
 
 class SpawnAThousandTimesTest : public testing::TestWithParam<char const*> {};
 
-TEST_P(SpawnAThousandTimesTest, LeavesNothingBehind) {
+TEST_P(SpawnAThousandTimesTest, LeaksNothing) {
   TProgramRun const run = RunProgram(std::string(ZEP_BUILD_DIR "/tests/programs/SpawnsAThousandTimes ") + GetParam());
-  EXPECT_EQ(run.exitCode, 0);  // also without what a sanitizer for leaks would find
+  EXPECT_EQ(run.exitCode, 0);  // also without a report of a leak sanitizer
   EXPECT_EQ(run.output, "0 descriptors, no children, 0 bytes\n");
 }
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// The identity of a remote server, with a stand-in for the IPMI client library, and the files of debug sessions.
+// The identity of a remote server, with a stand-in for the IPMI client library.
 
 #include "TOSSpecific.h"
 
@@ -96,7 +96,7 @@ TEST_F(RemoteIdentityTest, TheResultIsCutOutOfTheResponse) {
   }
 }
 
-TEST_F(RemoteIdentityTest, SerialNumberAndTypeHaveTheirLengthAlsoAroundAZeroByte) {
+TEST_F(RemoteIdentityTest, SerialNumberAndTypeKeepTheirLengthAroundAZeroByte) {
   EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMSN,
                      "\x1E"
                      "AB\0DEFG hi"s),
@@ -115,11 +115,11 @@ TEST_F(RemoteIdentityTest, SerialNumberAndTypeHaveTheirLengthAlsoAroundAZeroByte
   EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMT, ""), std::string(4, '\0'));
 }
 
-TEST_F(RemoteIdentityTest, TheWholeBufferMayBeFilled) {
+TEST_F(RemoteIdentityTest, TheCompleteBufferMayBeFilled) {
   std::string const full(256, 'f');
   EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMSN, full), "fffffff");
   EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMachineModel, full), std::string(251, 'f')) << "ends with the buffer";
-  for (int length : {0, 1, 65535})  // whatever the library says that it wrote
+  for (int length : {0, 1, 65535})  // whatever length the library reports
     EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMT, Answer("1234AB7"), length), "1234") << length;
 }
 
@@ -136,7 +136,7 @@ TEST_F(RemoteIdentityTest, ASuccessIsLoggedWithTheResponseAsText) {
   }
 }
 
-TEST_F(RemoteIdentityTest, WithoutASessionTheResultIsEmptyAndNothingIsAsked) {
+TEST_F(RemoteIdentityTest, WithoutASessionTheResultIsEmptyAndNoCommandIsSent) {
   for (int result : {1, -1, 1000})
     for (TOperation const& operation : kOperations) {
       SCOPED_TRACE(operation.name);

@@ -16,7 +16,7 @@ using namespace std::string_literals;
 using testing::ElementsAreArray;
 using testing::IsEmpty;
 
-TEST(TOSSpecificTextTest, RemoveNonAlpaNumericTakesTheTextOutOfItsBrackets) {
+TEST(TOSSpecificTextTest, RemoveNonAlpaNumericReturnsTheTextInItsBrackets) {
   struct {
     char const *text, *expected;
   } const rows[] = {
@@ -43,7 +43,7 @@ TEST(TOSSpecificTextTest, RemoveNonAlpaNumericTakesTheTextOutOfItsBrackets) {
   }
 }
 
-TEST(TOSSpecificTextTest, BreakApartVersionSplitsAtTheSecondHyphenWhereThereIsOne) {
+TEST(TOSSpecificTextTest, BreakApartVersionSplitsAtTheSecondHyphenIfThereIsOne) {
   struct {
     char const *text, *head, *tail;
   } const rows[] = {
@@ -96,7 +96,7 @@ TEST(TOSSpecificTextTest, MultiStringTokSplitsAtZeroBytes) {
   }
 }
 
-TEST(TOSSpecificTextTest, MultiStringTokTakesAStringThatEndsMoreThanTwoBytesBeforeTheEnd) {
+TEST(TOSSpecificTextTest, MultiStringTokReturnsAStringThatEndsMoreThanTwoBytesBeforeTheEnd) {
   // The zero byte of "ab" has the offset 2.
   for (unsigned long length : {0ul, 1ul, 2ul, 3ul, 4ul}) {
     SCOPED_TRACE(length);
@@ -132,7 +132,7 @@ private:
   bool fIsGuarded;
 };
 
-TEST(TOSSpecificTextTest, MultiStringTokReadsNothingBehindTheBuffer) {
+TEST(TOSSpecificTextTest, MultiStringTokReadsNothingAfterTheBuffer) {
   TGuardedPage const page;
   ASSERT_TRUE(page.IsGuarded());
   struct {

@@ -24,7 +24,7 @@ using testing::IsEmpty;
 using testing::StartsWith;
 using TLines = std::vector<std::string>;
 
-// While it lives, the stand-in is what "libcurl.so" names.
+// While it lives, "libcurl.so" is the stand-in.
 class TStandIn {
 public:
   explicit TStandIn(TCurlRecord& record, std::string const& variant = "whole")
@@ -41,7 +41,7 @@ private:
   void* fLibrary;
 };
 
-// Does something with a stand-in for libcurl, and expects that it leaves nothing behind: no descriptor, no loaded library.
+// Runs `work` with a stand-in for libcurl, and expects that it leaks nothing: no descriptor, no loaded library.
 void WithStandIn(TCurlRecord& record, std::function<void()> const& work, std::string const& variant = "whole") {
   int const descriptors = OpenDescriptors();
   {
@@ -122,7 +122,7 @@ struct TRefusal {
   char const* lastCall;
 };
 
-// Everything ends at the refused option: what is logged, what was called last, and that all was released.
+// Everything ends at the refused option: checks the log, the last call, and that all was released.
 void ExpectRefusals(std::vector<TRefusal> const& rows, std::function<void()> const& operation) {
   for (TRefusal const& row : rows) {
     SCOPED_TRACE(row.message);
@@ -182,7 +182,7 @@ TEST_F(TransferTest, AFileThatCannotBeReadEndsAnUploadAfterTheCommonOptions) {
   EXPECT_THAT(fRecord.calls, ElementsAreArray(Joined(kStart, {}, kEnd)));
 }
 
-TEST_F(TransferTest, AnUploadOfWhatCannotBeReadToItsEndIsAccessDenied) {
+TEST_F(TransferTest, AnUploadThatCannotBeReadToItsEndIsAccessDenied) {
   for (std::string const& file : {fDir.Path(), std::string("/proc/self/mem")}) {  // both open; the second one fails with EIO
     SCOPED_TRACE(file);
     TCurlRecord record;
@@ -196,7 +196,7 @@ TEST_F(TransferTest, AnUploadOfWhatCannotBeReadToItsEndIsAccessDenied) {
   }
 }
 
-TEST_F(TransferTest, AFailedPerformSaysItsOwnReasonAlsoWhereTheFileCannotBeRead) {
+TEST_F(TransferTest, AFailedPerformKeepsItsReasonEvenWhenTheFileCannotBeRead) {
   fRecord.result = 67;
   fRecord.errorText = "Access denied: 530";
   TLines log;
@@ -206,7 +206,7 @@ TEST_F(TransferTest, AFailedPerformSaysItsOwnReasonAlsoWhereTheFileCannotBeRead)
   EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error performing command: Access denied: 530"));
 }
 
-TEST_F(TransferTest, WhatPerformGivesBecomesAStatus) {
+TEST_F(TransferTest, TheResultOfPerformBecomesAStatus) {
   struct TRow {
     int result;
     char const* errorText;
@@ -276,7 +276,7 @@ TEST_F(TransferTest, EachOfTheSixFunctionsIsNeeded) {
   }
 }
 
-// The core library, and what a loader may find beside it and elsewhere.
+// The core library, and the copies of libcurl that the linker may find beside it and elsewhere.
 class LoadingCurlTest : public testing::Test {
 protected:
   LoadingCurlTest() {
@@ -487,7 +487,7 @@ TEST_F(TransferTest, ALocalFileThatCannotBeDeletedEndsQuietly) {
   EXPECT_TRUE(fs::is_directory(fFile));
 }
 
-TEST_F(TransferTest, ALocalFileThatCannotBeReadIsNotAskedAbout) {
+TEST_F(TransferTest, NoQuestionIsAskedAboutAnUnreadableLocalFile) {
   WriteFile(fFile, "old");
   fs::permissions(fFile, fs::perms::owner_write | fs::perms::others_write);
   fs::permissions(fDir.Path(), fs::perms::all);
@@ -546,7 +546,7 @@ TEST_F(TransferTest, UserUploadNamesTheRemoteFileFirst) {
   EXPECT_EQ(testing::internal::GetCapturedStdout(), "Remote file name = nightly.xml.gz\n");
 }
 
-TEST_F(TransferTest, WhatATransferThrowsPassesThrough) {
+TEST_F(TransferTest, ExceptionsOfATransferPassThrough) {
   WriteFile(fFile, "text");
   for (auto const& operation : std::vector<std::function<void()>>{
            [&] { TOSSpecific::FTPFile("h", fFile, "n"); }, [&] { TOSSpecific::sFTPFile("h", fFile, "n"); },
@@ -580,7 +580,7 @@ TEST_F(ProxyCheckTest, SetsItsOptionsInOrder) {
   EXPECT_THAT(log, IsEmpty());
 }
 
-TEST_F(ProxyCheckTest, ThePageIsAddedToAFileThatIsThere) {
+TEST_F(ProxyCheckTest, ThePageIsAppendedToAnExistingFile) {
   WriteFile(fDir.Path("content.html"), "earlier ");
   fRecord.chunks = {"page"};
   WithStandIn(fRecord, [] { EXPECT_EQ(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), kZEPStatusOK); });
@@ -637,7 +637,7 @@ TEST_F(ProxyCheckTest, LibcurlsTextTravelsWithTheStatus) {
   }
 }
 
-TEST_F(ProxyCheckTest, APortThatIsNoNumberIsNone) {
+TEST_F(ProxyCheckTest, APortThatIsNotANumberIsZero) {
   WithStandIn(fRecord, [] { TOSSpecific::CheckProxySetting("p", "many", "", 0); });
   EXPECT_THAT(fRecord.calls, testing::IsSupersetOf({"setopt PROXYPORT 0", "setopt PROXYUSERPWD ''"}));
 }

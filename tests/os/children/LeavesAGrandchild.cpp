@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Ends at once and leaves a child of its own behind, which prints later and holds the output open until then.
+// Ends at once, but its own child lives on, prints later and holds the output open until then.
 #include <unistd.h>
 
 int main() {

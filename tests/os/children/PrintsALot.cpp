@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Prints as many bytes as its argument says: the alphabet, over and over.
+// Prints the alphabet repeatedly: as many bytes as its argument.
 #include <unistd.h>
 
 #include <cstdlib>

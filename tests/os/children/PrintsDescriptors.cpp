@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Prints the open descriptors above standard error, each with what it names.
+// Prints the open descriptors above standard error, each with its file.
 #include <dirent.h>
 #include <unistd.h>
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Prints what becomes of two signals here: blocked or not, and ignored, caught or left to end the process.
+// Prints the state of two signals: blocked or not, and ignored, caught or with the default action.
 #include <signal.h>
 
 #include <cstdio>

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Writes its second argument into the file that its first names, and prints what is of no interest.
+// Writes its second argument into the file that its first names, and prints an irrelevant text.
 #include <cstdio>
 
 int main(int, char** arguments) {

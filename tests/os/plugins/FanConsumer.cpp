@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// A consumer plug-in, whose consumer says when it ends.
+// A consumer plug-in, whose consumer reports its end.
 
 #include "INamespaceConsumer.h"
 

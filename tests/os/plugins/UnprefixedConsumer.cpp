@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// A consumer plug-in whose factory lacks the base name in front.
+// A consumer plug-in whose factory's name lacks the base name at its start.
 
 #include "INamespaceConsumer.h"
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// A library that calls a function which nobody has.
+// A library that calls a function which does not exist.
 
 #include "ZEPExport.h"
 

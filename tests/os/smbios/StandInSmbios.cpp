@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// A stand-in for libsmbios.so: does what the environment says and writes each call down.
+// A stand-in for libsmbios.so, controlled by the environment. It records each call.
 //
 //   STANDIN_RECORD       the file that the calls are written to
 //   STANDIN_LOAD_STATUS, STANDIN_GET_STATUS, STANDIN_LENGTH    what is returned; 0, 0 and the structure's length without
-//   STANDIN_NO_HANDLE    set: loading hands out null
+//   STANDIN_NO_HANDLE    set: loading sets a null handle
 //   STANDIN_STRUCTURE    the file with the structure that is copied
 
 #include "platform/include/smbios.h"

@@ -25,7 +25,7 @@ using testing::ElementsAre;
 using testing::IsEmpty;
 
 // Reads a table that lies in memory of exactly its size, so that the address sanitizer sees a read past its end, and
-// checks that every structure is whole and lies in it, each behind the one before.
+// checks that every structure is complete and within the table, each after the one before.
 std::vector<int> TypesIn(std::string const& bytes) {
   std::unique_ptr<char[]> const exact(new char[bytes.size()]);
   std::memcpy(exact.get(), bytes.data(), bytes.size());
@@ -51,7 +51,7 @@ TEST(SmbiosTableTest, GivesTheStructuresOfRealTables) {
   }
 }
 
-TEST(SmbiosTableTest, AStructureEndsBehindItsDoubleZero) {
+TEST(SmbiosTableTest, AStructureEndsAfterItsDoubleZero) {
   std::string const first = Structure(1, "\1\2\0\0"s, {"one", "two"});
   std::string const second = Structure(2, "ab");
   std::string const table = first + second + EndOfTable();
@@ -64,7 +64,7 @@ TEST(SmbiosTableTest, AStructureEndsBehindItsDoubleZero) {
 
 TEST(SmbiosTableTest, TypesAreUnsigned) { EXPECT_THAT(TypesIn(Structure(255, "") + Structure(128, "")), ElementsAre(255, 128)); }
 
-TEST(SmbiosTableTest, NextOfTypeStepsOverTheOthersAndGoesOnBehindTheLast) {
+TEST(SmbiosTableTest, NextOfTypeSkipsTheOthersAndContinuesAfterTheLast) {
   std::string const table =
       Structure(17, "a") + Structure(4, "b") + Structure(17, "c") + Structure(17, "d") + EndOfTable() + Structure(17, "e");
   TStructureReader reader(table);
@@ -79,7 +79,7 @@ TEST(SmbiosTableTest, AReaderWithoutATableIsAtTheEnd) {
   EXPECT_TRUE(TStructureReader().NextOfType(0).empty());
 }
 
-TEST(SmbiosTableTest, DamagedTablesEndInFrontOfTheDamage) {
+TEST(SmbiosTableTest, DamagedTablesEndBeforeTheDamage) {
   std::string const good = Structure(0, "xy", {"ok"});
   struct TRow {
     char const* what;
@@ -117,7 +117,7 @@ TEST(SmbiosTableTest, DamagedTablesEndInFrontOfTheDamage) {
   }
 }
 
-TEST(SmbiosTableTest, EveryTruncationOfARealTableGivesItsWholeStructures) {
+TEST(SmbiosTableTest, EveryTruncationOfARealTableGivesItsCompleteStructures) {
   std::string const table = RealTable("full");
   std::vector<int> const all = TypesIn(table);
   for (std::size_t size = 0; size < table.size(); ++size) {
@@ -255,7 +255,7 @@ TEST(SmbiosTableTest, RealEntryPointsAreSoundButForTheirAddress) {
     entry.resize(32);
     EXPECT_TRUE(DmiTableIn(entry + table).empty()) << "a physical address lies behind the file";
 
-    // What `dmidecode --dump-bin` does: the address becomes 32, and the checksums follow.
+    // As `dmidecode --dump-bin` does it: the address becomes 32, and the checksums are adjusted.
     if (is64) {
       entry = WithCheckSum(entry.replace(0x10, 8, LittleEndian(32, 8)), 5, 0, 24);
     } else {
@@ -267,7 +267,7 @@ TEST(SmbiosTableTest, RealEntryPointsAreSoundButForTheirAddress) {
 }
 
 // dmidecode reads the same files: it must see the same structures.
-TEST(SmbiosTableTest, SeesWhatDmidecodeSees) {
+TEST(SmbiosTableTest, ReadsTheSameAsDmidecode) {
   std::string const dmidecode = OutputOfCommand("PATH=$PATH:/usr/sbin:/sbin command -v dmidecode");
   NEEDS(!dmidecode.empty(), "dmidecode is not installed");
   TTempDir dir;

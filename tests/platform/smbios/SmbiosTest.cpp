@@ -61,7 +61,7 @@ protected:
     return THandle(handle, fClose);
   }
 
-  // What a call copies into a buffer of that size, and the length it says, as "status length bytes".
+  // The result of a call with a buffer of that size, as "status length bytes".
   template <class TGet>
   std::string Got(TGet get, THandle const& handle, int type, int size = 4096) {
     std::vector<char> buffer(static_cast<std::size_t>(size) + 8, '#');
@@ -136,7 +136,7 @@ TEST_F(SmbiosLibraryTest, ReadsDumpsWithAnyEntryPoint) {
   EXPECT_EQ(First(Open(EntryPointLegacy(table.size()) + table), 1), system);
 }
 
-TEST_F(SmbiosLibraryTest, LoadSaysWhyItFails) {
+TEST_F(SmbiosLibraryTest, EachFailureOfLoadHasItsStatus) {
   std::string const table = RealTable("full");
   struct TRow {
     char const* what;
@@ -217,7 +217,7 @@ TEST_F(SmbiosLibraryTest, WithoutTheVariableTheKernelsTablesAreRead) {
   }
 }
 
-TEST_F(SmbiosLibraryTest, TheVariableIsLookedAtByEachLoad) {
+TEST_F(SmbiosLibraryTest, EachLoadReadsTheVariable) {
   THandle const first = Open(Structure(1, "first"));
   THandle const second = Open(Structure(1, "second"));
   EXPECT_EQ(First(first, 1), Whole(Structure(1, "first"))) << "a handle keeps its own copy";
@@ -257,7 +257,7 @@ TEST_F(SmbiosLibraryTest, ThreadsOpenAndReadAtOnce) {
   EXPECT_EQ(right, 800);
 }
 
-TEST_F(SmbiosLibraryTest, TheProviderIsNotLookedAt) {
+TEST_F(SmbiosLibraryTest, TheProviderIsIgnored) {
   WriteFile(fDir.Path("table"), RealTable("full"));
   TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", fDir.Path("table").c_str());
   void* handle = nullptr;
@@ -265,7 +265,7 @@ TEST_F(SmbiosLibraryTest, TheProviderIsNotLookedAt) {
   EXPECT_EQ(fClose(handle), kSmbiosOk);
 }
 
-TEST_F(SmbiosLibraryTest, OfAHugeFileTheFirst16MiBAreLookedAt) {
+TEST_F(SmbiosLibraryTest, OnlyTheFirst16MiBOfAHugeFileAreRead) {
   constexpr std::size_t kLimit = 16u << 20;
   std::string const filler = Structure(2, ""), last = Structure(3, "");
   std::string table;
@@ -282,13 +282,13 @@ TEST_F(SmbiosLibraryTest, GetFirstGivesTheFirstOfAType) {
   EXPECT_EQ(First(handle, 127), Whole(EndOfTable()));
 }
 
-TEST_F(SmbiosLibraryTest, ATypeThatIsNotThereIsNoMoreItems) {
+TEST_F(SmbiosLibraryTest, AMissingTypeIsNoMoreItems) {
   THandle const handle = Open(RealTable("full"));
   for (int type : {2, 126, 255, 256, 257, -1, 1 << 30}) EXPECT_EQ(First(handle, type), "status 5") << type;
   for (int type : {2, 255, 256, -1}) EXPECT_EQ(Next(handle, type), "status 5") << type;
 }
 
-TEST_F(SmbiosLibraryTest, AStructureIsCutToTheBufferAndItsLengthTold) {
+TEST_F(SmbiosLibraryTest, AStructureIsCutToTheBufferAndItsLengthReported) {
   std::string const structure = Structure(1, "fields", {"one", "two"});
   THandle const handle = Open(structure);
   for (std::size_t size = 0; size <= structure.size() + 1; ++size) {
@@ -337,7 +337,7 @@ TEST_F(SmbiosLibraryTest, GetNextOnAFreshHandleBeginsWithTheFirst) {
   EXPECT_EQ(Next(handle, 4), "status 5");
 }
 
-TEST_F(SmbiosLibraryTest, ASearchThatFindsNothingLeavesThePlace) {
+TEST_F(SmbiosLibraryTest, ASearchThatFindsNothingKeepsThePlace) {
   THandle const handle = Open(Structure(4, "a") + Structure(17, "b") + Structure(4, "c"));
   EXPECT_EQ(First(handle, 4), Whole(Structure(4, "a")));
   EXPECT_EQ(First(handle, 9), "status 5");
@@ -345,7 +345,7 @@ TEST_F(SmbiosLibraryTest, ASearchThatFindsNothingLeavesThePlace) {
   EXPECT_EQ(Next(handle, 17), Whole(Structure(17, "b")));
 }
 
-TEST_F(SmbiosLibraryTest, TheSampleHoldsAWholeServer) {
+TEST_F(SmbiosLibraryTest, TheSampleDescribesACompleteServer) {
   THandle const handle = Open(ReadFile(SamplePath()));
   std::vector<int> counts;
   for (int type : {0, 1, 2, 3, 4, 16, 17, 127}) {

@@ -51,7 +51,7 @@ TEST(UsbLanAddressTest, AnInterfaceReachesTheControllerOfItsNetworkWhileItIsUp) 
   for (TRow const& row : rows) EXPECT_EQ(Reaches(row.interface, row.node), row.reaches) << row.what;
 }
 
-// What the kernel shows below /sys/class/net.
+// The kernel's files in /sys/class/net.
 class ControllerInterfacesTest : public testing::Test {
 protected:
   void AddInterface(std::string const& name, std::string const& driver) {

@@ -54,7 +54,7 @@ TEST_F(TSmbiosReaderTest, AllStructuresOfATypeComeInTableOrder) {
   EXPECT_EQ(*fReader->First(17).Text(4), "a");
 }
 
-TEST_F(TSmbiosReaderTest, ATypeThatIsNotThereSaysSo) {
+TEST_F(TSmbiosReaderTest, AMissingTypeHasItsReason) {
   Read(Structure(4, "\1", {"only"}) + EndOfTable());
   EXPECT_THAT(TextsOf(17), IsEmpty());
   EXPECT_EQ(fReader->WhyNone(17).fCode, "not-given");

@@ -108,7 +108,7 @@ TEST_F(UsbLanTest, OtherAddressesStay) {
   EXPECT_EQ(AddressesOf("bmc0"), "169.254.7.8/16 ");
 }
 
-TEST_F(UsbLanTest, WithoutTheRightToConfigureItSaysSo) {
+TEST_F(UsbLanTest, WithoutTheRightToConfigureItReportsEPERM) {
   RunShell("ip link add bmc0 type veth peer name far0");
   ::setenv("ZEP_USBLAN_INTERFACES", "bmc0", 1);
   pid_t const child = ::fork();
