@@ -5,6 +5,7 @@
 #include "core/Handles.h"
 #include "core/Log.h"
 #include "os/LocalTime.h"
+#include "os/SystemLog.h"
 
 #include <syslog.h>
 
@@ -44,9 +45,7 @@ void TOSSpecific::OutputLogString(std::string) {}
 void TOSSpecific::DebugOut(std::string text) { LogDebug("TOSSpecific debug output: ", text); }
 
 void TOSSpecific::LogSELEvent(char const* text, ILogger::EZEPLogSeverity severity, int) {
-  ::openlog("YBNQ", LOG_NDELAY, LOG_SYSLOG);
-  ::syslog(PriorityOf(severity), "%s", text);
-  ::closelog();
+  WriteToSystemLog(PriorityOf(severity), text);
 }
 
 bool TOSSpecific::SetDebugLevel(int level, char* path) {
