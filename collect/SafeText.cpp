@@ -26,7 +26,7 @@ std::string Escaped(std::uint32_t code) {
 template <class TIsToBeEscaped>
 std::string WithEscaped(std::string_view text, TIsToBeEscaped isToBeEscaped) {
   std::string escaped;
-  escaped.reserve(4 * text.size());  // enough for "\\xff": the text is never moved, so a secret leaves no copy behind
+  escaped.reserve(4 * text.size());  // enough for "\\xff" each: a reallocation would leave a copy of a secret
   while (!text.empty()) {
     TCharacter const first = FirstCharacterOf(text);
     std::size_t const size = std::max<std::size_t>(first.fSize, 1);

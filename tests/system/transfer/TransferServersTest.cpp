@@ -153,7 +153,7 @@ TEST_P(FileServerTest, ADownloadMakesMissingDirectoriesOnAnFtpServerToo) {
 
 TEST_P(FileServerTest, NobodyThereIsAFailedConnection) {
   std::string const file = LocalFile("text"), port = fServer->Port();
-  fServer.reset();  // now nobody listens on that port
+  fServer.reset();  // no server listens on that port any more
   std::string const unanswered = GetParam() + "://zep:secret@127.0.0.1:" + port + "/f";
   ExpectFailure([&] { Put(unanswered, file); }, kZEPStatusConnectionFailed, {kConnecting});
   ExpectFailure([&] { Get(unanswered, fDir.Path("down")); }, kZEPStatusConnectionFailed, {kConnecting});

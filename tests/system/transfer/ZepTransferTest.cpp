@@ -245,7 +245,7 @@ std::string Numbers(int from, int count) {
   return text;
 }
 
-// A relay in front of the FTP server that breaks the first data connection after 100,000 bytes, and no other.
+// A relay to the FTP server. It breaks the first data connection, and only that one, after 100,000 bytes.
 std::vector<std::string> BreakingOnce(std::string const& serverPort, std::vector<std::string> options = {}) {
   for (char const* option : {"--ftp", "--control", "--times", "1", "0"}) options.push_back(option);
   options.push_back(serverPort);

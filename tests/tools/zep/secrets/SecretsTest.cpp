@@ -104,7 +104,7 @@ TEST(SecretsTest, ATableHoldsDataAsTheyAre) {
   EXPECT_EQ(table.GetText(), "table-key   x\n");
 }
 
-// What a block of memory holds when it comes back.
+// Records the content of each block of memory when it is given back, before it is freed.
 struct TLookedAtMemory {
   static void* Take(std::size_t size) { return ::operator new(size); }
   static void GiveBack(void* memory, std::size_t size) {

@@ -17,7 +17,7 @@
 namespace NQRVZEP20::zep {
 namespace {
 
-// A TCP port of loopback that nobody else has as long as it lives.
+// Reserves a TCP port of loopback as long as the object exists.
 class TPort {
 public:
   TPort() : fSocket(::socket(AF_INET, SOCK_STREAM, 0)) {
