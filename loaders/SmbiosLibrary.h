@@ -28,26 +28,26 @@ public:
     kClosedWithTables  // each object loads the library anew
   };
 
-  // Opens the tables; throws nothing.
+  // Opens the tables. Never throws.
   explicit TSmbiosTables(ELibraryLife life);
 
-  // How loading the library ended.
+  // The outcome of loading the library.
   TLoadOutcome const& Library() const { return fLibrary->Outcome(); }
 
-  // Returned by the library on opening; of no meaning when it could not be loaded.
+  // The library's status on opening; meaningless when the library could not be loaded.
   int OpenStatus() const { return fOpenStatus; }
 
   // The errno that the library left on opening; 0 when it left none.
   int OpenError() const { return fOpenError; }
 
-  // A library may report success and hand out nothing.
+  // Whether the library returned a handle. A library may report success without returning one.
   bool HasHandle() const { return fHandle != nullptr; }
 
-  // Copies the first structure of that type into the buffer of `size` bytes, which the caller has cleared, and returns
-  // the library's status; kSmbiosFail without a handle. `length` lies within 0 to `size`, whatever the library reports.
+  // Copies the first structure of that type into the buffer of `size` bytes, which the caller has cleared. Returns the
+  // library's status, or kSmbiosFail without a handle. `length` becomes 0 to `size`, whatever length the library reports.
   int GetFirst(int type, void* buffer, int size, int& length);
 
-  // The same for the next structure of that type. kSmbiosNoMoreItems with a library that lacks smBiosGetNext.
+  // The same for the next structure of that type. Returns kSmbiosNoMoreItems with a library that lacks smBiosGetNext.
   int GetNext(int type, void* buffer, int size, int& length);
 
   void Close() { fHandle.reset(); }

@@ -1,6 +1,6 @@
 # SPDX-License-Identifier: Apache-2.0
 
-# Functions that the scripts here share: installing packages, building. Source this file; it changes to the root directory.
+# Functions that the scripts share: installing packages, and building. Sourcing this file changes to the root directory.
 
 cd "$(dirname "${BASH_SOURCE[0]}")/.."
 install=yes
@@ -23,21 +23,21 @@ need_packages() {
   done
   [[ ${#missing[@]} -gt 0 ]] || return 0
   if [[ $install == no ]]; then
-    echo "Missing packages (not installed, as asked): ${missing[*]}" >&2
+    echo "Missing packages, not installed because of --no-install: ${missing[*]}" >&2
     return 0
   fi
   local as_root=()
   [[ $(id -u) == 0 ]] || as_root=(sudo)
   if [[ ${#as_root[@]} -gt 0 ]] && ! command -v sudo >/dev/null; then
-    echo "Packages are missing that only root can install, and there is no sudo. As root: apt-get install ${missing[*]}" >&2
+    echo "Packages are missing, and sudo is not installed. Run as root: apt-get install ${missing[*]}" >&2
     return 1
   fi
-  echo "Installing what is missing: ${missing[*]}"
+  echo "Installing missing packages: ${missing[*]}"
   "${as_root[@]}" apt-get update -qq
   "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive apt-get install -y -qq --no-install-recommends "${missing[@]}" >/dev/null
 }
 
-# Configures and builds a preset: build PRESET [TARGET...]. With `with_tests` OFF the tests are left out, which needs fewer
+# Configures and builds a preset: build PRESET [TARGET...]. When `with_tests` is OFF, the tests are not built, which needs fewer
 # packages.
 with_tests=ON
 build() {

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// SMBIOS tables for tests: the real ones of tests/data/smbios, and pieces to build others from.
+// SMBIOS tables for tests: the real tables of tests/data/smbios, and functions that build others.
 
 #include "tests/Support.h"
 
@@ -14,14 +14,15 @@ namespace NQRVZEP20 {
 
 using namespace std::string_literals;
 
-// The directories below tests/data/smbios: what the kernel exported on virtual machines with chosen strings.
+// The directories below tests/data/smbios. Each holds the tables that the kernel of a virtual machine with chosen strings
+// exported.
 inline std::vector<std::string> const kRealTables = {"full", "bare7", "eight", "no-serial", "two-dashes", "qemu-own", "entry64"};
 
 inline std::string RealTablePath(std::string const& name) { return std::string(ZEP_TEST_DATA_DIR) + "/smbios/" + name + "/DMI"; }
 
 inline std::string RealTable(std::string const& name) { return ReadFile(RealTablePath(name)); }
 
-// The invented server that the front end brings along, in the form of `dmidecode --dump-bin`.
+// The invented server that is bundled with the front end, in the format of `dmidecode --dump-bin`.
 inline std::string SamplePath() { return std::string(ZEP_SOURCE_DIR) + "/tools/zep/sample/smbios.bin"; }
 
 inline std::string LittleEndian(unsigned long long number, int bytes) {
@@ -30,7 +31,7 @@ inline std::string LittleEndian(unsigned long long number, int bytes) {
   return text;
 }
 
-// A structure with these fields behind its header and these strings. Without strings the set is two zero bytes.
+// A structure with these fields after its header, and these strings. Without strings, the string set is two zero bytes.
 inline std::string Structure(int type, std::string const& fields, std::vector<std::string> const& strings = {}) {
   std::string structure = LittleEndian(type, 1) + LittleEndian(4 + fields.size(), 1) + LittleEndian(type, 2) + fields;
   for (std::string const& text : strings) structure += text + '\0';
@@ -39,12 +40,12 @@ inline std::string Structure(int type, std::string const& fields, std::vector<st
 
 inline std::string EndOfTable() { return Structure(127, ""); }
 
-// Type 1 whose product name and serial number are strings 1 and 2.
+// A structure of type 1 whose product name is string 1 and whose serial number is string 2.
 inline std::string SystemInformation(std::string const& productName, std::string const& serialNumber) {
   return Structure(1, "\0\1\0\2"s + std::string(19, '\0'), {productName, serialNumber});
 }
 
-// Type 0 whose version is string 2.
+// A structure of type 0 whose version is string 2.
 inline std::string BiosInformation(std::string const& version) {
   return Structure(0, "\1\2"s + std::string(18, '\0'), {"Example Works", version});
 }
@@ -59,8 +60,8 @@ inline std::string WithCheckSum(std::string entryPoint, std::size_t offset, std:
 
 inline std::string Version(int version) { return LittleEndian(version >> 8, 1) + LittleEndian(version & 0xFF, 1); }
 
-// Entry points as `dmidecode --dump-bin` puts them in front of a table, filled up to 32 bytes.
-// The version is major and minor, 0x208 for 2.8.
+// Entry points as `dmidecode --dump-bin` writes them before a table, padded to 32 bytes. The high byte of `version` is the major
+// number, the low byte the minor: 0x208 means 2.8.
 inline std::string EntryPoint32(std::size_t tableSize, std::size_t tableAddress = 32, int length = 0x1F, int version = 0x208) {
   std::string const inner = "_DMI_\0"s + LittleEndian(tableSize, 2) + LittleEndian(tableAddress, 4) + "\0\0\x28\0"s;
   std::string entry = "_SM_\0"s + LittleEndian(length, 1) + Version(version) + std::string(8, '\0') + inner;
@@ -76,7 +77,7 @@ inline std::string EntryPoint64(std::size_t tableSize, unsigned long long tableA
   return WithCheckSum(entry, 5, 0, length);
 }
 
-// That of before SMBIOS 2.1, whose version is one byte: 0x20 for 2.0.
+// The entry point of tables older than SMBIOS 2.1. Its version is one byte: 0x20 means 2.0.
 inline std::string EntryPointLegacy(std::size_t tableSize, std::size_t tableAddress = 32, int version = 0x20) {
   std::string entry =
       "_DMI_\0"s + LittleEndian(tableSize, 2) + LittleEndian(tableAddress, 4) + "\0\0"s + LittleEndian(version, 1);
@@ -84,7 +85,7 @@ inline std::string EntryPointLegacy(std::size_t tableSize, std::size_t tableAddr
   return WithCheckSum(entry, 5, 0, 0x0F);
 }
 
-// A process's standard output.
+// Returns the command's standard output.
 inline std::string OutputOfCommand(std::string const& command) {
   std::string output;
   FILE* const pipe = ::popen(command.c_str(), "r");

@@ -6,7 +6,7 @@
  * The SMBIOS access library, libsmbios.so. The core loads it at run time by smBiosLoad, smBiosGetFirst and smBiosClose
  * and never links it.
  *
- * The tables are those the kernel exports (/sys/firmware/dmi/tables/DMI, which only root may read), or those in the file
+ * The tables are those that the kernel exports (/sys/firmware/dmi/tables/DMI, which only root may read), or those in the file
  * that the environment variable ZEP_SMBIOS_TABLE names: a bare DMI table, or a dump as `dmidecode --dump-bin` writes it, with
  * an entry point of any form ("_SM3_", "_SM_", "_DMI_"). Each smBiosLoad reads the variable; the file read last is not
  * read again while it is unchanged. A table ends at its end-of-table structure (type 127), or before the first

@@ -35,7 +35,7 @@ struct TTableFile {
 };
 using TSharedTableFile = std::shared_ptr<TTableFile const>;
 
-// An open handle, and the place after the structure that was copied last.
+// An open handle: the file, and the position after the structure that was copied last.
 struct THandle {
   TSharedTableFile file;
   smbios::TStructureReader place;
@@ -53,16 +53,16 @@ int StatusOfOpenError(int error) {
   return kSmbiosFileSystemError;
 }
 
-// The file read last. It is not read again while the file and its time of change stay the same.
+// Caches the file that was read last. It is not read again while the file and its change time are the same.
 class TLastFile {
 public:
-  // Null when it is another file, or has changed.
+  // Null when `status` belongs to another file or the file has changed.
   TSharedTableFile Find(struct stat const& status) const {
     std::lock_guard<std::mutex> const lock(fMutex);
     return fState == StateOf(status) ? fFile : nullptr;
   }
 
-  // Two changes within one clock tick have the same time, so a file is kept only when its last change is old enough.
+  // Two changes within one clock tick have the same change time, so a file is cached only when its last change is old enough.
   void Keep(struct stat const& status, TSharedTableFile file) {
     constexpr std::time_t kSettledAfterSeconds = 1;
     if (std::time(nullptr) - status.st_ctim.tv_sec <= kSettledAfterSeconds) return;
@@ -80,7 +80,7 @@ private:
 
   mutable std::mutex fMutex;
   TState fState;
-  TSharedTableFile fFile;  // null: none yet
+  TSharedTableFile fFile;  // null: nothing is cached yet
 };
 
 TLastFile& LastFile() {
@@ -88,7 +88,8 @@ TLastFile& LastFile() {
   return *lastFile;
 }
 
-// Reads the complete file of that size, up to the limit. With one byte more in the buffer, the first read finds the end.
+// Reads the complete file, of `size` bytes, up to kMaxFileSize. The buffer has room for one byte more, so that reading stops at
+// the end of the file.
 bool ReadWhole(int fd, std::size_t size, std::string& contents) {
   contents.resize(std::min(size + 1, kMaxFileSize));
   std::size_t filled = 0;

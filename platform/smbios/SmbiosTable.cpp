@@ -21,8 +21,8 @@ std::uint64_t NumberAt(std::string_view bytes, std::size_t offset, std::size_t s
   return number;
 }
 
-// The complete structure at the start of the bytes, or none.
-TStructure FrontOf(std::string_view bytes) {
+// The complete structure at the start of the bytes; empty when there is none.
+TStructure FirstStructureOf(std::string_view bytes) {
   if (bytes.size() < kHeaderSize) return {};
   std::size_t const formattedLength = ByteAt(bytes, 1);
   if (formattedLength < kHeaderSize || formattedLength > bytes.size()) return {};
@@ -39,17 +39,17 @@ bool IsSumZero(std::string_view bytes) {
                          [](unsigned sum, char byte) { return (sum + static_cast<unsigned char>(byte)) & 0xFFu; }) == 0;
 }
 
-// The offsets of the needed fields of an entry point. All are within `minLength` bytes.
+// The offsets of the entry point's fields that are read here. All of them are within `minLength` bytes.
 struct TEntryPointLayout {
   std::string_view anchor;
   std::size_t minLength, maxLength;  // allowed values of the length byte
   std::size_t lengthOffset;
   std::size_t tableSizeOffset, tableSizeBytes;
   std::size_t tableAddressOffset, tableAddressBytes;
-  bool hasInnerPart;  // which has its own anchor and checksum
+  bool hasInnerPart;  // the inner part has its own anchor and checksum
 };
 
-// The length 0x1E is a known mistake for 0x1F.
+// Some firmware is known to give the length 0x1E where 0x1F is correct.
 constexpr TEntryPointLayout kEntryPoint32 = {"_SM_"sv, 0x1E, 0x20, 5, 0x16, 2, 0x18, 4, true};
 constexpr TEntryPointLayout kEntryPoint64 = {"_SM3_"sv, 0x18, 0x20, 6, 0x0C, 4, 0x10, 8, false};
 
@@ -58,7 +58,8 @@ bool IsInnerPartSound(std::string_view entryPoint) {
   return StartsWith(inner, "_DMI_"sv) && IsSumZero(inner);
 }
 
-// The table at that address of a file, cut at the end of the file; empty when the address is not after the entry point.
+// The table at `address` in the file, cut at the end of the file. Empty when `address` is inside the entry point or after the
+// end of the file.
 std::string_view TableAt(std::string_view file, std::uint64_t address, std::size_t entryPointLength, std::uint64_t size) {
   if (address < entryPointLength || address > file.size()) return {};
   return file.substr(address, size);
@@ -75,7 +76,7 @@ std::string_view TableNamedBy(TEntryPointLayout const& layout, std::string_view 
   return TableAt(file, address, length, NumberAt(file, layout.tableSizeOffset, layout.tableSizeBytes));
 }
 
-// The entry point from before SMBIOS 2.1, which has no length byte.
+// The length of an entry point older than SMBIOS 2.1, which has no length byte.
 constexpr std::size_t kLegacyLength = 0x0F;
 
 bool BeginsWithLegacyEntryPoint(std::string_view file) {
@@ -91,7 +92,7 @@ std::string_view TableNamedByLegacy(std::string_view file) {
 int TypeOf(TStructure structure) { return static_cast<int>(ByteAt(structure, 0)); }
 
 TStructure TStructureReader::Next() {
-  TStructure const structure = FrontOf(fRest);
+  TStructure const structure = FirstStructureOf(fRest);
   fRest.remove_prefix(structure.size());
   if (structure.empty() || TypeOf(structure) == kEndOfTableType) fRest = {};
   return structure;

@@ -13,15 +13,15 @@ namespace {
 constexpr char const* kTableFileVariable = "ZEP_SMBIOS_TABLE";
 constexpr char const* kKernelTable = "/sys/firmware/dmi/tables/DMI";
 
-constexpr std::size_t kLargestStructure = 64 * 1024;  // what is longer is cut
-constexpr std::size_t kMostStructures = 4096;         // of one type, so that no library keeps us for ever
+constexpr std::size_t kLargestStructure = 64 * 1024;  // a longer structure is truncated
+constexpr std::size_t kMostStructures = 4096;         // of one type: a library may return structures endlessly
 
 std::string TableFile() {
   char const* file = std::getenv(kTableFileVariable);
   return file != nullptr ? file : "";
 }
 
-// ": Too many open files", or an empty text where the library has left no reason.
+// ": Too many open files"; empty when the library has left no errno.
 std::string Reason(int status, int error) {
   return status == kSmbiosFileSystemError && error != 0 ? ": " + std::generic_category().message(error) : "";
 }
@@ -29,7 +29,7 @@ std::string Reason(int status, int error) {
 TMissing WhyNotLoaded(TLoadOutcome const& outcome) {
   if (outcome.fKind == TLoadOutcome::kNotLoaded)
     return {kMissingUnreadable, "the SMBIOS library cannot be loaded: " + outcome.fReason};
-  return {kMissingUnreadable, "libsmbios.so lacks a function that it should have"};
+  return {kMissingUnreadable, "libsmbios.so lacks a function that is required"};
 }
 
 TMissing WhyTablesFailed(TSmbiosTables const& tables, std::string const& tableFile) {
@@ -38,16 +38,16 @@ TMissing WhyTablesFailed(TSmbiosTables const& tables, std::string const& tableFi
   if (!tableFile.empty()) {
     std::string const what = "the SMBIOS table file " + tableFile;
     if (status == kSmbiosFileNotFound) return {kMissingUnreadable, what + " does not exist"};
-    if (status == kSmbiosAccessDenied) return {kMissingUnreadable, what + " may not be read by this user"};
+    if (status == kSmbiosAccessDenied) return {kMissingUnreadable, what + " cannot be read: this user lacks the permission"};
     if (status == kSmbiosFileSystemError) return {kMissingUnreadable, what + " cannot be read" + Reason(status, error)};
-    return {kMissingUnreadable, what + " holds no SMBIOS table"};
+    return {kMissingUnreadable, what + " does not contain an SMBIOS table"};
   }
   if (status == kSmbiosFileNotFound) return {kMissingNoTables, "no SMBIOS tables exported"};
   if (status == kSmbiosAccessDenied) return {kMissingNeedsRoot, "needs root (SMBIOS tables)"};
   return {kMissingUnreadable, "the system's SMBIOS tables cannot be read" + Reason(status, error)};
 }
 
-// The structure that `get` copies; empty when there is none.
+// The structure that `get` copies; empty when it copies none.
 std::vector<unsigned char> Read(TSmbiosTables& tables, decltype(&TSmbiosTables::GetFirst) get, int type) {
   std::vector<unsigned char> buffer(kLargestStructure);
   int length = 0;
@@ -114,7 +114,7 @@ std::string TSmbiosReader::SourceOf(int type) const {
 
 TMissing TSmbiosReader::WhyNone(int type) const {
   if (!fTables) return fWhyNot;
-  return {kMissingNotGiven, "the SMBIOS tables hold no structure of type " + std::to_string(type) + " (" + NameOf(type) + ")"};
+  return {kMissingNotGiven, "the SMBIOS tables contain no structure of type " + std::to_string(type) + " (" + NameOf(type) + ")"};
 }
 
 }  // namespace NQRVZEP20

@@ -12,8 +12,8 @@ namespace NQRVZEP20 {
 
 class TSmbiosTables;
 
-// The SMBIOS tables, as libsmbios.so reads them: this machine's, or those of the file that the environment variable
-// ZEP_SMBIOS_TABLE names. Where the library or the tables cannot be had, every structure is missing, with the reason.
+// The SMBIOS tables as libsmbios.so reads them: this machine's, or those of the file that the environment variable
+// ZEP_SMBIOS_TABLE names. When the library or the tables cannot be read, every structure is missing, with the reason.
 class TSmbiosReader {
 public:
   TSmbiosReader();
@@ -21,23 +21,23 @@ public:
   TSmbiosReader(TSmbiosReader const&) = delete;
   TSmbiosReader& operator=(TSmbiosReader const&) = delete;
 
-  // The first structure of that type, or the one that is not there and says why.
+  // The first structure of that type, or a missing structure, whose fields are missing with the reason.
   TSmbiosStructure First(int type) const;
 
-  // Every structure of that type, in the order of the table. With a library that cannot go on after the first: the first.
+  // Every structure of that type, in the order of the table. With a library that lacks smBiosGetNext: the first only.
   std::vector<TSmbiosStructure> All(int type) const;
 
-  // The version of the standard that the tables follow, as VersionOfTables has it.
+  // The version of the SMBIOS standard that the tables follow, as VersionOfTables returns it.
   TFinding<std::optional<TSmbiosVersion>> Version() const;
 
-  // What the values of such a structure come from: "SMBIOS type 17", or "SMBIOS type 17 (file)".
+  // The source of the values of a structure of that type: "SMBIOS type 17", or "SMBIOS type 17 (file)".
   std::string SourceOf(int type) const;
 
-  // Why there is no structure of that type.
+  // The reason why there is no structure of that type.
   TMissing WhyNone(int type) const;
 
 private:
-  std::unique_ptr<TSmbiosTables> fTables;  // null: the tables cannot be had, for the reason in fWhyNot
+  std::unique_ptr<TSmbiosTables> fTables;  // null: the tables cannot be read, for the reason in fWhyNot
   TMissing fWhyNot;
   std::string fTableFile;  // empty: this machine's own tables
 };

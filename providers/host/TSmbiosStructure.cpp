@@ -19,7 +19,7 @@ std::uint64_t LittleEndian(std::vector<unsigned char> const& bytes) {
 }
 
 constexpr std::size_t kHeaderSize = 4;
-constexpr std::size_t kLengthOffset = 1;  // of the byte with the size of header and formatted area
+constexpr std::size_t kLengthOffset = 1;  // the byte with the size of the header and the formatted area
 
 }  // namespace
 

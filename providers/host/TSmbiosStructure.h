@@ -10,7 +10,7 @@
 
 namespace NQRVZEP20 {
 
-// The structure types that are read.
+// The structure types that the host provider reads.
 constexpr int kSmbiosBios = 0;
 constexpr int kSmbiosSystem = 1;
 constexpr int kSmbiosChassis = 3;
@@ -23,7 +23,7 @@ class TSmbiosStructure {
 public:
   explicit TSmbiosStructure(std::vector<unsigned char> bytes);
 
-  // A structure that is missing: every field is missing for that reason.
+  // A missing structure: every field is missing for that reason.
   explicit TSmbiosStructure(TMissing why);
 
   // Fields of the formatted area. Older versions of the standard have shorter structures: a field that is not completely within
@@ -34,7 +34,7 @@ public:
   TFinding<std::vector<unsigned char>> Bytes(std::size_t offset, std::size_t count) const;
 
   // The string to which the field at that offset refers, verbatim. Missing when the field is 0, when the string set has fewer
-  // strings, and when the string has no end.
+  // strings, or when the string has no end.
   TFinding<std::string> Text(std::size_t offset) const;
 
 private:

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// What the scripts say where they cannot go on.
+// The scripts' messages when they cannot continue.
 
 #include "tests/Support.h"
 #include "tests/os/Programs.h"
@@ -14,13 +14,13 @@ namespace fs = std::filesystem;
 
 class ScriptsTest : public testing::Test {
 protected:
-  // A program that the scripts find: a script of one line.
+  // Adds a program, a script of one line, to the PATH of Run.
   void Program(std::string const& name, std::string const& line) {
     WriteFile(fDir.Path(name), "#!/bin/bash\n" + line + "\n");
     fs::permissions(fDir.Path(name), fs::perms::owner_all);
   }
 
-  // scripts/lib.sh and a function of it, with no programs but those of the test, sed and dirname.
+  // Runs a function of scripts/lib.sh. Only sed, dirname, grep and the test's programs are on PATH.
   TProgramRun Run(std::string const& function) {
     for (char const* program : {"sed", "dirname", "grep"})
       fs::create_symlink(std::string("/usr/bin/") + program, fDir.Path(program));
@@ -31,13 +31,13 @@ protected:
   TTempDir fDir;
 };
 
-TEST_F(ScriptsTest, PackagesThatOnlyRootCanInstallAreNamedWhereThereIsNoSudo) {
+TEST_F(ScriptsTest, WithoutSudoTheMissingPackagesAreNamed) {
   Program("id", "echo 1000");
   Program("dpkg-query", "exit 1");
   TProgramRun const run = Run("need_packages build");
   EXPECT_EQ(run.exitCode, 1);
-  EXPECT_THAT(run.output, testing::StartsWith("Packages are missing that only root can install, and there is no sudo. "
-                                              "As root: apt-get install cmake "));
+  EXPECT_THAT(run.output, testing::StartsWith("Packages are missing, and sudo is not installed. Run as root: "
+                                              "apt-get install cmake "));
   EXPECT_EQ(run.output.find("command not found"), std::string::npos) << run.output;
 }
 

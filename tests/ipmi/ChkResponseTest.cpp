@@ -30,10 +30,10 @@ TEST(GenSumTest, IsTheTwosComplementOfTheSum) {
       {"responder address and network function", "\x20\x18"s, 0, 1, 0xC8},
       {"the second byte alone", "\x20\x18"s, 1, 1, 0xE8},
       {"a part in the middle", "\xFF\x20\x18\xFF"s, 1, 2, 0xC8},
-      {"no byte", "\x20\x18"s, 1, 0, 0},
+      {"no bytes", "\x20\x18"s, 1, 0, 0},
       {"last far below first", "\x20\x18"s, 0, -2147483647 - 1, 0},
       {"zeros", "\0\0\0"s, 0, 2, 0},
-      {"bytes above 127 count as unsigned", "\x80\x81"s, 0, 1, 0xFF},
+      {"bytes above 127 are unsigned", "\x80\x81"s, 0, 1, 0xFF},
       {"modulo 256", std::string(200, '\xFF'), 0, 199, 200},
       {"a sum of 256", "\x80\x80"s, 0, 1, 0},
   };
@@ -85,7 +85,7 @@ bool Check(IIPMILan& link, std::string const& packet, int lengthPosition, int mo
   return link.ChkResponse(area.data(), lengthPosition, mode);
 }
 
-TEST(ChkResponseTest, EachModeMakesItsOwnTests) {
+TEST(ChkResponseTest, EachModeTestsOnlyItsOwnParts) {
   struct TRow {
     bool isChecksumRight;
     int completionCode;
@@ -124,7 +124,7 @@ TEST(ChkResponseTest, AFailureDoesNotChangeTheStatus) {
   EXPECT_TRUE(link.getipmiLanStatus());
 }
 
-TEST(ChkResponseTest, AuthenticationType0ReadsTheLength16PlacesEarlier) {
+TEST(ChkResponseTest, AuthenticationType0ReadsTheLength16BytesEarlier) {
   IIPMILan& link = *IIPMILan::Initialize();
   std::string packet = Packet(EAuthentication::kMD5, 0, "abc");
   EXPECT_TRUE(Check(link, packet, kLengthPosition, 0));
@@ -183,7 +183,7 @@ TEST(ChkResponseTest, ALengthPositionBeforeThePacketFailsTheTestThatNeedsIt) {
     IIPMILan& link = *IIPMILan::Initialize();
     EXPECT_FALSE(Check(link, packet, position, 0));
     EXPECT_FALSE(Check(link, packet, position, 1));
-    EXPECT_EQ(Check(link, packet, position, 2), position == 15) << "there the completion code is byte 6";
+    EXPECT_EQ(Check(link, packet, position, 2), position == 15) << "at position 15 the completion code is byte 6";
     EXPECT_TRUE(Check(link, packet, position, 3));
   }
 }
@@ -198,7 +198,7 @@ public:
   TGuardedPage(TGuardedPage const&) = delete;
   TGuardedPage& operator=(TGuardedPage const&) = delete;
 
-  char* AtTheFront(std::string const& bytes) const { return Copy(bytes, fPages + kSize); }
+  char* AtTheStart(std::string const& bytes) const { return Copy(bytes, fPages + kSize); }
   char* AtTheEnd(std::string const& bytes) const { return Copy(bytes, fPages + 2 * kSize - bytes.size()); }
 
 private:
@@ -218,7 +218,7 @@ TEST(ChkResponseTest, NoLengthMakesTheCheckReadOutsideTheBuffer) {
       std::string packet(static_cast<std::size_t>(14 + std::max(length, 7)), '\x11');
       packet[4] = 0;
       packet[13] = static_cast<char>(length);
-      EXPECT_EQ(link.ChkResponse(page.AtTheFront(packet), kLengthPosition, mode),
+      EXPECT_EQ(link.ChkResponse(page.AtTheStart(packet), kLengthPosition, mode),
                 link.ChkResponse(page.AtTheEnd(packet), kLengthPosition, mode))
           << "length " << length << ", mode " << mode;
     }
@@ -227,9 +227,10 @@ TEST(ChkResponseTest, NoLengthMakesTheCheckReadOutsideTheBuffer) {
 TEST(ChkResponseTest, AModeReadsOnlyTheBytesThatItTests) {
   IIPMILan& link = *IIPMILan::Initialize();
   std::string const whole = Packet(EAuthentication::kNone, 0, "");
-  EXPECT_TRUE(Check(link, whole.substr(0, 21), kLengthPosition, 2)) << "no checksum is there";
-  EXPECT_TRUE(Check(link, std::string(13, '\0') + "\x02\x40\xC0"s, kLengthPosition, 1)) << "no completion code is there";
-  EXPECT_TRUE(Check(link, "\0\0\0\0\0"s, kLengthPosition, 3)) << "only the authentication type is there";
+  EXPECT_TRUE(Check(link, whole.substr(0, 21), kLengthPosition, 2)) << "the packet ends before the checksum";
+  EXPECT_TRUE(Check(link, std::string(13, '\0') + "\x02\x40\xC0"s, kLengthPosition, 1))
+      << "the packet ends before the completion code";
+  EXPECT_TRUE(Check(link, "\0\0\0\0\0"s, kLengthPosition, 3)) << "the packet ends after the authentication type";
 }
 
 }  // namespace

@@ -77,10 +77,10 @@ TEST_F(IIPMILanTest, InitializeMakesAFreshLinkEachTime) {
   EXPECT_THAT(LogOf([&] { fresh->IpmiInBandLanConnect(0, "p"); }),
               testing::Contains("[Debug] > OpenConnection(3, 169.254.95.118, 623, , )"))
       << "accounts are empty";
-  EXPECT_TRUE(fLink->getipmiLanStatus()) << "the old one is not freed";
+  EXPECT_TRUE(fLink->getipmiLanStatus()) << "the old link is not freed";
 }
 
-TEST_F(IIPMILanTest, EachNodeHasItsAddress) {
+TEST_F(IIPMILanTest, EachNodeHasItsOwnAddress) {
   char const* const addresses[] = {
       "169.254.95.118",  "169.254.96.118",  "169.254.97.118",  "169.254.98.118",  "169.254.99.118",  "169.254.100.118",
       "169.254.101.118", "169.254.102.118", "169.254.103.118", "169.254.104.118", "169.254.105.118", "169.254.106.118",
@@ -98,7 +98,7 @@ TEST_F(IIPMILanTest, EachNodeHasItsAddress) {
 
 // ---- Accounts ----
 
-TEST_F(IIPMILanTest, AnAccountIsThatOfItsNode) {
+TEST_F(IIPMILanTest, EachNodeHasItsOwnAccount) {
   for (int node = 0; node < 16; ++node) fLink->setAccount(node, "user" + std::to_string(node), "password" + std::to_string(node));
   for (int node : {15, 0, 7}) {
     fLink->IpmiInBandLanConnect(node, "p");
@@ -144,7 +144,7 @@ TEST_F(IIPMILanTest, OpeningLogsThePasswordAndRemembersTheParameters) {
                           "[Debug] password: secret", "[Debug] > OpenConnection(3, bmc.example, 623, zepadmin, secret)",
                           "[Debug] Open IPMI Lan Connection successfully. \n"));
   EXPECT_THAT(SessionParameters(), ElementsAre("bmc.example", "623", "zepadmin", "secret"));
-  EXPECT_FALSE(fLink->getipmiLanStatus()) << "only a response makes it true";
+  EXPECT_FALSE(fLink->getipmiLanStatus()) << "only a response makes the status true";
 }
 
 TEST_F(IIPMILanTest, TheParametersAreStoredAfterTheCall) {
@@ -189,7 +189,7 @@ TEST_F(IIPMILanTest, ClosingWithoutASessionStillCallsTheLibrary) {
   EXPECT_THAT(
       LogOf([&] { fLink->IpmilanCloseConnect(); }),
       ElementsAre("[Debug] Enter IpmilanCloseConnect", "[Debug] > CloseConnection()", "[Debug] Exit IpmilanCloseConnect"));
-  EXPECT_GE(::fcntl(0, F_GETFD), 0) << "standard input is no socket of the link";
+  EXPECT_GE(::fcntl(0, F_GETFD), 0) << "standard input is not closed in place of a socket";
 }
 
 // ---- In-band ----
@@ -225,7 +225,7 @@ TEST_F(IIPMILanTest, InBandLogsAndReturnsItsFailure) {
                           "[Debug] username: ", "[Debug] password: ", "[Debug] > OpenConnection(3, 169.254.96.118, 623, , )",
                           "[Debug] Connection Error code:4", "[Debug] Open IPMI Lan Connection failed. \n",
                           "[Debug] IPMILan Local connected Failed in plugin:libFan"));
-  EXPECT_EQ(fLink->getCurrentHost(), "169.254.96.118") << "the node is the current one all the same";
+  EXPECT_EQ(fLink->getCurrentHost(), "169.254.96.118") << "the node becomes the current one nevertheless";
 }
 
 TEST_F(IIPMILanTest, AThrownIntegerIsLoggedWithoutTheFirstLetter) {
@@ -238,12 +238,12 @@ TEST_F(IIPMILanTest, AThrownIntegerIsLoggedWithoutTheFirstLetter) {
 TEST_F(IIPMILanTest, TheSessionOfTheCurrentNodeIsReusedWhileTheStatusIsTrue) {
   ASSERT_TRUE(fLink->IpmiInBandLanConnect(3, "p"));
   EXPECT_THAT(LogOf([&] { EXPECT_TRUE(fLink->IpmiInBandLanConnect(3, "p")); }), testing::SizeIs(8))
-      << "the status is false yet: it is asked for and a session opened";
+      << "the status is still false, so it is read and a session is opened";
   GetAResponse();
   EXPECT_THAT(LogOf([&] { EXPECT_TRUE(fLink->IpmiInBandLanConnect(3, "p")); }), ElementsAre("[Debug] getipmiLanStatus = 1"));
   EXPECT_THAT(LogOf([&] { EXPECT_TRUE(fLink->IpmiInBandLanConnect(4, "p")); }), testing::SizeIs(7)) << "another node";
   EXPECT_THAT(LogOf([&] { EXPECT_TRUE(fLink->IpmiInBandLanConnect(4, "p")); }), ElementsAre("[Debug] getipmiLanStatus = 1"))
-      << "the status stays true from one node to the next";
+      << "the status remains true when the node changes";
   fLink->IpmilanCloseConnect();
   EXPECT_THAT(LogOf([&] { EXPECT_TRUE(fLink->IpmiInBandLanConnect(4, "p")); }), testing::SizeIs(8));
 }
@@ -251,7 +251,7 @@ TEST_F(IIPMILanTest, TheSessionOfTheCurrentNodeIsReusedWhileTheStatusIsTrue) {
 TEST_F(IIPMILanTest, InBandDoesNothingWhileDisabledOrWithTheGlobalAccount) {
   fLink->m_enabled = 0;
   EXPECT_THAT(LogOf([&] { EXPECT_FALSE(fLink->IpmiInBandLanConnect(0, "p")); }), IsEmpty());
-  EXPECT_EQ(fLink->getCurrentHost(), "") << "no node became the current one";
+  EXPECT_EQ(fLink->getCurrentHost(), "") << "no node has become the current one";
   fLink->m_enabled = 1;
   fLink->m_useGlobalAccount = true;
   EXPECT_THAT(LogOf([&] { EXPECT_FALSE(fLink->IpmiInBandLanConnect(0, "p")); }), IsEmpty());
@@ -262,7 +262,7 @@ TEST_F(IIPMILanTest, InBandDoesNothingWhileDisabledOrWithTheGlobalAccount) {
 
 // ---- USB-LAN ----
 
-TEST_F(IIPMILanTest, BringsUpEveryNodeThatIsNotUp) {
+TEST_F(IIPMILanTest, BringsUpEveryNodeThatIsDown) {
   UseUsbLan("whole", "4");
   ::setenv("STANDIN_UP", "1", 1);
   EXPECT_THAT(LogOf([&] { EXPECT_TRUE(fLink->bringupOvdLan()); }),
@@ -300,11 +300,11 @@ TEST_F(IIPMILanTest, WithoutTheUsbLanLibraryOrOneOfItsFunctionsNothingIsBroughtU
 
 TEST_F(IIPMILanTest, AUsbLanLibraryWithAnUnresolvedSymbolIsUsed) {
   UseUsbLan("unresolved", "0");
-  EXPECT_EQ(::dlopen("./ovdusblan.so", RTLD_NOW), nullptr) << "there should be something that is lacking";
+  EXPECT_EQ(::dlopen("./ovdusblan.so", RTLD_NOW), nullptr) << "a symbol of the library should be unresolved";
   EXPECT_TRUE(fLink->bringupOvdLan());
 }
 
-TEST_F(IIPMILanTest, TheUsbLanLibraryIsTheOneInTheWorkingDirectory) {
+TEST_F(IIPMILanTest, TheUsbLanLibraryIsLoadedFromTheWorkingDirectory) {
   UseUsbLan("whole");
   std::filesystem::create_directory(fDir.Path("elsewhere"));
   std::filesystem::current_path(fDir.Path("elsewhere"));
@@ -322,7 +322,7 @@ TEST_F(IIPMILanTest, AnExceptionThrownByTheUsbLanLibraryIsLogged) {
     EXPECT_FALSE(IsUsbLanLoaded());
   }
   ::setenv("STANDIN_THROWS", "GetNodes int", 1);
-  EXPECT_TRUE(fLink->IpmiInBandLanConnect(0, "p")) << "the session is opened all the same";
+  EXPECT_TRUE(fLink->IpmiInBandLanConnect(0, "p")) << "the session is opened nevertheless";
 }
 
 // ---- For callers that speak the protocol themselves ----
@@ -371,7 +371,7 @@ TEST_F(IIPMILanTest, PasswordAndAddressAreCopiedCompletelyForAnySize) {
 
 TEST_F(IIPMILanTest, SocketAndServerAddressAreReturned) {
   EXPECT_EQ(fLink->getTheSocket(), -1);
-  EXPECT_TRUE(fLink->closeSocket()) << "also without one";
+  EXPECT_TRUE(fLink->closeSocket()) << "also without a socket";
   fLink->m_saServer.sin_port = 623;
   EXPECT_EQ(fLink->getSaServer().sin_port, 623);
   static_assert(sizeof(fLink->getSaServer()) == 16);
@@ -383,11 +383,11 @@ TEST_F(IIPMILanTest, SocketAndServerAddressAreReturned) {
   EXPECT_EQ(::fcntl(socket, F_GETFD), -1);
   int const another = ::dup(0);  // most likely gets the same number
   EXPECT_TRUE(fLink->closeSocket());
-  EXPECT_GE(::fcntl(another, F_GETFD), 0) << "what was closed is not closed again";
+  EXPECT_GE(::fcntl(another, F_GETFD), 0) << "the number of a closed socket is not closed again";
   ::close(another);
 }
 
-// ---- Without the platform library ----
+// ---- With an incomplete platform library ----
 
 TEST(IncompleteIpmiClientTest, AMissingFunctionGivesNotFoundAndTheOthersAreUsed) {
   LoadStandInIpmiClient("without-open");

@@ -4,13 +4,13 @@
 #include <functional>
 #include <string>
 
-// The settings of the stand-in for libipmiClient.so, which logs each call, between the library's own lines, and behaves as
+// The settings of the stand-in for libipmiClient.so. The stand-in records each call in the core library's log and behaves as
 // set here.
 struct TStandInIpmiClient {
   int openResult = 0;
   int sendResult = 0;
   std::string response;          // the response that SendIpmiCommand writes
-  int responseLength = -1;       // the length that it reports; -1: the true one
+  int responseLength = -1;       // the length that it reports; -1: the true length
   int thrownByOpen = 0;          // an integer that OpenConnection throws; 0: none
   std::function<void()> atOpen;  // called by OpenConnection
 };

@@ -4,7 +4,7 @@
 //
 //   STANDIN_NODES    the number of nodes
 //   STANDIN_UP       the nodes that are up, as digits
-//   STANDIN_THROWS   the function that throws, and what it throws: "GetNodes int", "BringupOvdLan text"
+//   STANDIN_THROWS   the function that throws, and the kind of exception: "GetNodes int", "BringupOvdLan text"
 
 #include "ILogger.h"
 #include "TRootObject.h"
@@ -34,8 +34,8 @@ void Called(std::string const& function, std::string const& arguments) {
 #pragma GCC visibility push(default)
 
 #ifdef STANDIN_UNRESOLVED
-int ThereIsNoSuchFunction();
-int CallThereIsNoSuchFunction() { return ThereIsNoSuchFunction(); }
+int UndefinedFunction();
+int CallUndefinedFunction() { return UndefinedFunction(); }
 #endif
 
 #ifndef STANDIN_WITHOUT_NODES

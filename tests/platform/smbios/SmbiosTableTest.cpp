@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// The parser of libsmbios.so: structures out of real, damaged and hostile bytes.
+// Tests the parser of libsmbios.so with real, damaged and hostile tables.
 
 #include "platform/smbios/SmbiosTable.h"
 
@@ -24,8 +24,9 @@ using smbios::TStructureReader;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-// Reads a table that lies in memory of exactly its size, so that the address sanitizer sees a read past its end, and
-// checks that every structure is complete and within the table, each after the one before.
+// Returns the types of the structures of a table. The table is copied into a buffer of exactly its size, so that the address
+// sanitizer detects a read past its end. Checks that each structure is complete, within the table, and adjacent to the previous
+// one.
 std::vector<int> TypesIn(std::string const& bytes) {
   std::unique_ptr<char[]> const exact(new char[bytes.size()]);
   std::memcpy(exact.get(), bytes.data(), bytes.size());
@@ -40,11 +41,11 @@ std::vector<int> TypesIn(std::string const& bytes) {
     types.push_back(smbios::TypeOf(structure));
   }
   EXPECT_LE(end, exact.get() + bytes.size());
-  EXPECT_TRUE(reader.Next().empty()) << "the end stays the end";
+  EXPECT_TRUE(reader.Next().empty()) << "a reader at the end stays at the end";
   return types;
 }
 
-TEST(SmbiosTableTest, GivesTheStructuresOfRealTables) {
+TEST(SmbiosTableTest, ReadsTheStructuresOfRealTables) {
   for (std::string const& name : kRealTables) {
     SCOPED_TRACE(name);
     EXPECT_THAT(TypesIn(RealTable(name)), ElementsAre(0, 1, 3, 4, 16, 17, 19, 32, 127));
@@ -70,8 +71,8 @@ TEST(SmbiosTableTest, NextOfTypeSkipsTheOthersAndContinuesAfterTheLast) {
   TStructureReader reader(table);
   EXPECT_EQ(reader.NextOfType(17), Structure(17, "a"));
   EXPECT_EQ(reader.NextOfType(17), Structure(17, "c"));
-  EXPECT_TRUE(reader.NextOfType(4).empty()) << "it lies in front";
-  EXPECT_TRUE(reader.NextOfType(17).empty()) << "the search before went to the end";
+  EXPECT_TRUE(reader.NextOfType(4).empty()) << "the only structure of type 4 precedes the position";
+  EXPECT_TRUE(reader.NextOfType(17).empty()) << "the previous search has advanced to the end";
 }
 
 TEST(SmbiosTableTest, AReaderWithoutATableIsAtTheEnd) {
@@ -89,13 +90,13 @@ TEST(SmbiosTableTest, DamagedTablesEndBeforeTheDamage) {
   TRow const rows[] = {
       {"empty", "", {}},
       {"one byte", "\0"s, {}},
-      {"a header less one byte", "\1\4\0"s, {}},
-      {"a header and nothing", "\1\4\0\0"s, {}},
+      {"a header without its last byte", "\1\4\0"s, {}},
+      {"only a header", "\1\4\0\0"s, {}},
       {"a header and one zero", "\1\4\0\0\0"s, {}},
       {"the smallest structure", "\1\4\0\0\0\0"s, {1}},
       {"type 127 missing", good + good, {0, 0}},
-      {"bytes behind type 127", good + EndOfTable() + good, {0, 127}},
-      {"bytes behind the last whole structure", good + "abc", {0}},
+      {"bytes after type 127", good + EndOfTable() + good, {0, 127}},
+      {"bytes after the last complete structure", good + "abc", {0}},
       {"length 0", good + "\1\0\0\0\0\0"s + good, {0}},
       {"length 1", good + "\1\1\0\0\0\0"s + good, {0}},
       {"length 3", good + "\1\3\0\0\0\0"s + good, {0}},
@@ -104,12 +105,12 @@ TEST(SmbiosTableTest, DamagedTablesEndBeforeTheDamage) {
       {"length up to the end, no string set", "\1\6\0\0\0\0"s, {}},
       {"length 255", "\1\xFF\0\0"s + std::string(200, '\0'), {}},
       {"no double zero", good + "\1\4\0\0"s + "one\0two\0"s, {0}},
-      {"no zero at all", good + "\1\4\0\0"s + std::string(100, 'x'), {0}},
+      {"no zero byte", good + "\1\4\0\0"s + std::string(100, 'x'), {0}},
       {"the zeros begin in the formatted area", "\1\5\0\0\0"s + "\0"s, {}},
-      {"an empty string in front of others", "\1\4\0\0\0one\0\0"s, {1}},
+      {"an empty string before others", "\1\4\0\0\0one\0\0"s, {1}},
       {"all zero", std::string(4096, '\0'), {}},
       {"all 0xFF", std::string(4096, '\xFF'), {}},
-      {"type 127 at once", EndOfTable() + good, {127}},
+      {"type 127 first", EndOfTable() + good, {127}},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);
@@ -117,7 +118,7 @@ TEST(SmbiosTableTest, DamagedTablesEndBeforeTheDamage) {
   }
 }
 
-TEST(SmbiosTableTest, EveryTruncationOfARealTableGivesItsCompleteStructures) {
+TEST(SmbiosTableTest, ATruncatedTableHasOnlyItsCompleteStructures) {
   std::string const table = RealTable("full");
   std::vector<int> const all = TypesIn(table);
   for (std::size_t size = 0; size < table.size(); ++size) {
@@ -128,7 +129,7 @@ TEST(SmbiosTableTest, EveryTruncationOfARealTableGivesItsCompleteStructures) {
   }
 }
 
-TEST(SmbiosTableTest, NoChangedByteLeadsOutOfARealTable) {
+TEST(SmbiosTableTest, NoChangedByteMakesTheReaderLeaveTheTable) {
   std::string table = RealTable("full");
   std::size_t changed = 0;
   for (char& byte : table) {
@@ -142,20 +143,20 @@ TEST(SmbiosTableTest, NoChangedByteLeadsOutOfARealTable) {
   EXPECT_GT(changed, 0u);
 }
 
-TEST(SmbiosTableTest, NoiseIsReadToItsEndAtMost) {
+TEST(SmbiosTableTest, NoiseIsNotReadBeyondItsEnd) {
   for (unsigned seed = 0; seed < 200; ++seed) {
     SCOPED_TRACE(seed);
     std::mt19937 random(seed);
     std::string noise(65536, '\0');
-    // Many zeros and small lengths, so that some of it looks like structures.
+    // Many zeros and small lengths make parts of the noise look like structures.
     for (char& byte : noise) byte = static_cast<char>(random() % 3 == 0 ? random() % 8 : random());
-    noise[0] = 1;  // so that it begins with one
+    noise[0] = 1;  // the header of a structure
     noise[1] = 4;
     EXPECT_THAT(TypesIn(noise), testing::Not(IsEmpty()));
   }
 }
 
-TEST(SmbiosTableTest, AMillionStructuresAreOneStepEach) {
+TEST(SmbiosTableTest, AMillionStructuresAreReadOneByOne) {
   std::string table;
   for (int n = 0; n < 1000000; ++n) table.append("\1\4\0\0\0\0", 6);
   TStructureReader reader(table);
@@ -164,16 +165,16 @@ TEST(SmbiosTableTest, AMillionStructuresAreOneStepEach) {
   EXPECT_EQ(structures, 1000000);
 }
 
-TEST(SmbiosTableTest, ABareTableIsAllOfTheFile) {
+TEST(SmbiosTableTest, ABareTableIsTheWholeFile) {
   for (std::string const& name : kRealTables) EXPECT_EQ(DmiTableIn(RealTable(name)), RealTable(name)) << name;
   EXPECT_EQ(DmiTableIn("_SM"), "_SM");
   EXPECT_EQ(DmiTableIn("_DMI_"), "_DMI_");
   std::string const noEntryPoint = "_DMI_" + std::string(100, 'x');
-  EXPECT_EQ(DmiTableIn(noEntryPoint), noEntryPoint) << "a structure of type 95";
+  EXPECT_EQ(DmiTableIn(noEntryPoint), noEntryPoint) << "\"_\" is the type of the first structure, 95";
   EXPECT_TRUE(DmiTableIn("").empty());
 }
 
-TEST(SmbiosTableTest, AnEntryPointNamesTheTable) {
+TEST(SmbiosTableTest, AnEntryPointRefersToTheTable) {
   std::string const table = RealTable("full");
   struct TRow {
     char const* what;
@@ -182,17 +183,17 @@ TEST(SmbiosTableTest, AnEntryPointNamesTheTable) {
   };
   TRow const rows[] = {
       {"32 bits", EntryPoint32(table.size()) + table, table},
-      {"32 bits, the length off by one as it is known to be", EntryPoint32(table.size(), 32, 0x1E) + table, table},
-      {"32 bits, bytes behind the table", EntryPoint32(table.size()) + table + "behind", table},
-      {"32 bits, the table elsewhere", EntryPoint32(table.size(), 48) + std::string(16, 'x') + table, table},
-      {"32 bits, the file ends in the table", EntryPoint32(table.size()) + table.substr(0, 100), table.substr(0, 100)},
+      {"32 bits, the length 0x1E, a known mistake", EntryPoint32(table.size(), 32, 0x1E) + table, table},
+      {"32 bits, bytes after the table", EntryPoint32(table.size()) + table + "after", table},
+      {"32 bits, a gap before the table", EntryPoint32(table.size(), 48) + std::string(16, 'x') + table, table},
+      {"32 bits, the file ends within the table", EntryPoint32(table.size()) + table.substr(0, 100), table.substr(0, 100)},
       {"32 bits, a table of one byte", EntryPoint32(1) + table, table.substr(0, 1)},
       {"before 2.1", EntryPointLegacy(table.size()) + table, table},
-      {"before 2.1, the table right after it", EntryPointLegacy(table.size(), 15).substr(0, 15) + table, table},
-      {"before 2.1, the file ends in the table", EntryPointLegacy(table.size()) + table.substr(0, 100), table.substr(0, 100)},
+      {"before 2.1, the table immediately after it", EntryPointLegacy(table.size(), 15).substr(0, 15) + table, table},
+      {"before 2.1, the file ends within the table", EntryPointLegacy(table.size()) + table.substr(0, 100), table.substr(0, 100)},
       {"64 bits", EntryPoint64(table.size()) + table, table},
-      {"64 bits, the table right after it", EntryPoint64(table.size(), 24).substr(0, 24) + table, table},
-      {"64 bits, the largest size there is", EntryPoint64(0xFFFFFFFF) + table, table},
+      {"64 bits, the table immediately after it", EntryPoint64(table.size(), 24).substr(0, 24) + table, table},
+      {"64 bits, the largest possible size", EntryPoint64(0xFFFFFFFF) + table, table},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);
@@ -200,7 +201,7 @@ TEST(SmbiosTableTest, AnEntryPointNamesTheTable) {
   }
 }
 
-TEST(SmbiosTableTest, AnEntryPointThatCannotBeRightNamesNothing) {
+TEST(SmbiosTableTest, AnInvalidEntryPointHasNoTable) {
   std::string const table = RealTable("full");
   std::string const sound32 = EntryPoint32(table.size()) + table;
   std::string const sound64 = EntryPoint64(table.size()) + table;
@@ -212,28 +213,28 @@ TEST(SmbiosTableTest, AnEntryPointThatCannotBeRightNamesNothing) {
     char const* what;
     std::string file;
   };
-  std::string const innerAnchorSumsUp = WithCheckSum(WithCheckSum(with(sound32, 0x10, '-'), 0x15, 0x10, 0x0F), 4, 0, 0x1F);
-  std::string const innerSumWrong = WithCheckSum(with(sound32, 0x1E, 9), 4, 0, 0x1F);
+  std::string const wrongInnerAnchor = WithCheckSum(WithCheckSum(with(sound32, 0x10, '-'), 0x15, 0x10, 0x0F), 4, 0, 0x1F);
+  std::string const wrongInnerChecksum = WithCheckSum(with(sound32, 0x1E, 9), 4, 0, 0x1F);
   TRow const rows[] = {
-      {"32 bits: the anchor alone", "_SM_"},
-      {"32 bits: cut inside", sound32.substr(0, 31)},
+      {"32 bits: only the anchor", "_SM_"},
+      {"32 bits: truncated", sound32.substr(0, 31)},
       {"32 bits: no table after it", EntryPoint32(table.size())},
-      {"32 bits: checksum", with(sound32, 8, 1)},
-      {"32 bits: inner anchor", innerAnchorSumsUp},
-      {"32 bits: inner checksum", innerSumWrong},
+      {"32 bits: wrong checksum", with(sound32, 8, 1)},
+      {"32 bits: wrong inner anchor", wrongInnerAnchor},
+      {"32 bits: wrong inner checksum", wrongInnerChecksum},
       {"32 bits: length too small", EntryPoint32(table.size(), 32, 0x1D) + table},
       {"32 bits: length too large", WithCheckSum(with(sound32, 5, 0x21), 4, 0, 0x21)},
       {"32 bits: table inside the entry point", EntryPoint32(table.size(), 0x1E) + table},
-      {"32 bits: table behind the file", EntryPoint32(table.size(), 32 + table.size() + 1) + table},
+      {"32 bits: table after the end of the file", EntryPoint32(table.size(), 32 + table.size() + 1) + table},
       {"32 bits: highest address", EntryPoint32(table.size(), 0xFFFFFFFF) + table},
       {"32 bits: size 0", EntryPoint32(0) + table},
       {"before 2.1: no table after it", EntryPointLegacy(table.size())},
       {"before 2.1: table inside the entry point", EntryPointLegacy(table.size(), 14) + table},
       {"before 2.1: highest address", EntryPointLegacy(table.size(), 0xFFFFFFFF) + table},
       {"before 2.1: size 0", EntryPointLegacy(0) + table},
-      {"64 bits: the anchor alone", "_SM3_"},
-      {"64 bits: cut inside", sound64.substr(0, 23)},
-      {"64 bits: checksum", with(sound64, 8, 9)},
+      {"64 bits: only the anchor", "_SM3_"},
+      {"64 bits: truncated", sound64.substr(0, 23)},
+      {"64 bits: wrong checksum", with(sound64, 8, 9)},
       {"64 bits: length too small", EntryPoint64(table.size(), 32, 0x17) + table},
       {"64 bits: length too large", WithCheckSum(with(sound64, 6, 0x21), 5, 0, 0x21)},
       {"64 bits: table inside the entry point", EntryPoint64(table.size(), 23) + table},
@@ -246,16 +247,16 @@ TEST(SmbiosTableTest, AnEntryPointThatCannotBeRightNamesNothing) {
   }
 }
 
-TEST(SmbiosTableTest, RealEntryPointsAreSoundButForTheirAddress) {
+TEST(SmbiosTableTest, RealEntryPointsAreValidExceptForTheirAddress) {
   for (std::string const& name : kRealTables) {
     SCOPED_TRACE(name);
     std::string entry = ReadFile(std::string(ZEP_TEST_DATA_DIR) + "/smbios/" + name + "/smbios_entry_point");
     std::string const table = RealTable(name);
     bool const is64 = entry.size() == 24;
     entry.resize(32);
-    EXPECT_TRUE(DmiTableIn(entry + table).empty()) << "a physical address lies behind the file";
+    EXPECT_TRUE(DmiTableIn(entry + table).empty()) << "a physical address is after the end of the file";
 
-    // As `dmidecode --dump-bin` does it: the address becomes 32, and the checksums are adjusted.
+    // The address becomes 32 and the checksums are adjusted, as `dmidecode --dump-bin` does.
     if (is64) {
       entry = WithCheckSum(entry.replace(0x10, 8, LittleEndian(32, 8)), 5, 0, 24);
     } else {
@@ -266,8 +267,7 @@ TEST(SmbiosTableTest, RealEntryPointsAreSoundButForTheirAddress) {
   }
 }
 
-// dmidecode reads the same files: it must see the same structures.
-TEST(SmbiosTableTest, ReadsTheSameAsDmidecode) {
+TEST(SmbiosTableTest, ReadsTheSameStructuresAsDmidecode) {
   std::string const dmidecode = OutputOfCommand("PATH=$PATH:/usr/sbin:/sbin command -v dmidecode");
   NEEDS(!dmidecode.empty(), "dmidecode is not installed");
   TTempDir dir;

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// libsmbios.so through its C functions, loaded as the core loads it.
+// Tests libsmbios.so through its C functions; it is loaded in the same way as the core loads it.
 
 #include "platform/include/smbios.h"
 
@@ -68,7 +68,7 @@ protected:
     int length = size;
     int const status = get(handle.get(), type, buffer.data(), &length);
     std::string const bytes(buffer.data(), buffer.size());
-    EXPECT_EQ(bytes.substr(static_cast<std::size_t>(size)), "########") << "written behind the buffer";
+    EXPECT_EQ(bytes.substr(static_cast<std::size_t>(size)), "########") << "written after the end of the buffer";
     if (status != kSmbiosOk) {
       EXPECT_EQ(length, size) << "a failure changes nothing";
       EXPECT_EQ(bytes, std::string(buffer.size(), '#'));
@@ -122,13 +122,13 @@ TEST_F(SmbiosLibraryTest, ReadsRealTables) {
     THandle const handle = Open(RealTable(row.name));
     std::string const bios = First(handle, 0);
     std::string const system = First(handle, 1);
-    EXPECT_NE(bios.find(row.bios + "\0\0"s), bios.npos) << "its last string, with the double zero";
+    EXPECT_NE(bios.find(row.bios + "\0\0"s), bios.npos) << "the last string, followed by the double zero";
     EXPECT_NE(system.find("\0"s + row.product + "\0"s), system.npos);
     EXPECT_NE(system.find("\0"s + row.serial + "\0\0"s), system.npos);
   }
 }
 
-TEST_F(SmbiosLibraryTest, ReadsDumpsWithAnyEntryPoint) {
+TEST_F(SmbiosLibraryTest, ReadsDumpsWithEntryPointsOfAllForms) {
   std::string const table = RealTable("full");
   std::string const system = First(Open(table), 1);
   EXPECT_EQ(First(Open(EntryPoint32(table.size()) + table), 1), system);
@@ -158,11 +158,11 @@ TEST_F(SmbiosLibraryTest, EachFailureOfLoadHasItsStatus) {
   EXPECT_EQ(LoadStatusOfPath(fDir.Path("absent")), kSmbiosFileNotFound);
   EXPECT_EQ(LoadStatusOfPath(fDir.Path("table/below a file")), kSmbiosFileNotFound);
   EXPECT_EQ(LoadStatusOfPath(fDir.Path()), kSmbiosFail) << "a directory";
-  EXPECT_EQ(LoadStatusOfPath("/dev/zero"), kSmbiosFail) << "a device has no end";
+  EXPECT_EQ(LoadStatusOfPath("/dev/zero"), kSmbiosFail) << "a device is not a regular file";
 }
 
 TEST_F(SmbiosLibraryTest, LoadOfAFileThatCannotBeReadLeavesTheReasonInErrno) {
-  EXPECT_EQ(LoadStatusOfPath("/proc/self/mem"), kSmbiosFileSystemError) << "a read that fails";
+  EXPECT_EQ(LoadStatusOfPath("/proc/self/mem"), kSmbiosFileSystemError) << "the read fails";
   EXPECT_EQ(errno, EIO);
 
   WriteFile(fDir.Path("table"), RealTable("full"));
@@ -224,19 +224,19 @@ TEST_F(SmbiosLibraryTest, EachLoadReadsTheVariable) {
   EXPECT_EQ(First(second, 1), Whole(Structure(1, "second")));
 }
 
-// The library keeps the file that it read last, once that has been left alone for a while.
+// The library caches the file that it read last, once the file has been unchanged for a while.
 TEST_F(SmbiosLibraryTest, AChangedFileIsReadAgain) {
   EXPECT_EQ(First(Open(Structure(1, "one")), 1), Whole(Structure(1, "one")));
-  EXPECT_EQ(First(Open(Structure(1, "two")), 1), Whole(Structure(1, "two"))) << "changed at once, same size";
+  EXPECT_EQ(First(Open(Structure(1, "two")), 1), Whole(Structure(1, "two"))) << "changed immediately, with the same size";
 
   std::this_thread::sleep_for(std::chrono::milliseconds(2100));
   TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", fDir.Path("table").c_str());
   for (int time = 0; time < 3; ++time) {
     void* handle = nullptr;
     ASSERT_EQ(fLoad(nullptr, &handle), kSmbiosOk);
-    EXPECT_EQ(First(THandle(handle, fClose), 1), Whole(Structure(1, "two"))) << "left alone";
+    EXPECT_EQ(First(THandle(handle, fClose), 1), Whole(Structure(1, "two"))) << "unchanged";
   }
-  EXPECT_EQ(First(Open(Structure(1, "six")), 1), Whole(Structure(1, "six"))) << "changed after it was kept";
+  EXPECT_EQ(First(Open(Structure(1, "six")), 1), Whole(Structure(1, "six"))) << "changed after it was cached";
   std::filesystem::remove(fDir.Path("table"));
   EXPECT_EQ(LoadStatusOfPath(fDir.Path("table")), kSmbiosFileNotFound);
 }
@@ -257,7 +257,7 @@ TEST_F(SmbiosLibraryTest, ThreadsOpenAndReadAtOnce) {
   EXPECT_EQ(right, 800);
 }
 
-TEST_F(SmbiosLibraryTest, TheProviderIsIgnored) {
+TEST_F(SmbiosLibraryTest, TheProviderArgumentIsIgnored) {
   WriteFile(fDir.Path("table"), RealTable("full"));
   TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", fDir.Path("table").c_str());
   void* handle = nullptr;
@@ -270,19 +270,19 @@ TEST_F(SmbiosLibraryTest, OnlyTheFirst16MiBOfAHugeFileAreRead) {
   std::string const filler = Structure(2, ""), last = Structure(3, "");
   std::string table;
   while (table.size() + filler.size() + last.size() <= kLimit) table += filler;
-  EXPECT_EQ(First(Open(table + last), 3), Whole(last)) << "the last that ends in front of the limit";
-  EXPECT_EQ(First(Open(table + filler + last), 3), "status 5") << "the limit cuts it";
+  EXPECT_EQ(First(Open(table + last), 3), Whole(last)) << "this structure ends at or before the limit";
+  EXPECT_EQ(First(Open(table + filler + last), 3), "status 5") << "this structure extends beyond the limit";
 }
 
-TEST_F(SmbiosLibraryTest, GetFirstGivesTheFirstOfAType) {
+TEST_F(SmbiosLibraryTest, GetFirstReturnsTheFirstStructureOfAType) {
   THandle const handle = Open(Structure(0, "a") + Structure(1, "b", {"one"}) + Structure(1, "c") + EndOfTable());
   EXPECT_EQ(First(handle, 0), Whole(Structure(0, "a")));
   EXPECT_EQ(First(handle, 1), Whole(Structure(1, "b", {"one"})));
-  EXPECT_EQ(First(handle, 1), Whole(Structure(1, "b", {"one"}))) << "always the first";
+  EXPECT_EQ(First(handle, 1), Whole(Structure(1, "b", {"one"}))) << "always the first structure";
   EXPECT_EQ(First(handle, 127), Whole(EndOfTable()));
 }
 
-TEST_F(SmbiosLibraryTest, AMissingTypeIsNoMoreItems) {
+TEST_F(SmbiosLibraryTest, AMissingTypeReturnsNoMoreItems) {
   THandle const handle = Open(RealTable("full"));
   for (int type : {2, 126, 255, 256, 257, -1, 1 << 30}) EXPECT_EQ(First(handle, type), "status 5") << type;
   for (int type : {2, 255, 256, -1}) EXPECT_EQ(Next(handle, type), "status 5") << type;
@@ -300,7 +300,7 @@ TEST_F(SmbiosLibraryTest, AStructureIsCutToTheBufferAndItsLengthReported) {
   EXPECT_EQ(length, static_cast<int>(structure.size()));
 }
 
-TEST_F(SmbiosLibraryTest, ArgumentsThatCannotBeUsedFail) {
+TEST_F(SmbiosLibraryTest, InvalidArgumentsAreRefused) {
   THandle const handle = Open(RealTable("full"));
   char buffer[16] = {};
   for (auto const get : {fGetFirst, fGetNext}) {
@@ -317,27 +317,27 @@ TEST_F(SmbiosLibraryTest, ArgumentsThatCannotBeUsedFail) {
   EXPECT_EQ(fClose(nullptr), kSmbiosOk);
 }
 
-TEST_F(SmbiosLibraryTest, GetNextGivesTheStructuresOfATypeOneByOne) {
+TEST_F(SmbiosLibraryTest, GetNextReturnsTheStructuresOfATypeOneByOne) {
   THandle const handle =
       Open(Structure(17, "a") + Structure(4, "b") + Structure(17, "c") + Structure(4, "d") + EndOfTable() + Structure(17, "e"));
   EXPECT_EQ(First(handle, 17), Whole(Structure(17, "a")));
   EXPECT_EQ(Next(handle, 17), Whole(Structure(17, "c")));
   EXPECT_EQ(Next(handle, 17), "status 5");
-  EXPECT_EQ(Next(handle, 4), Whole(Structure(4, "d"))) << "behind the last that was copied, whatever its type";
+  EXPECT_EQ(Next(handle, 4), Whole(Structure(4, "d"))) << "the search starts after the structure copied last, whatever its type";
   EXPECT_EQ(Next(handle, 127), Whole(EndOfTable()));
-  EXPECT_EQ(Next(handle, 17), "status 5") << "nothing behind the end of the table";
-  EXPECT_EQ(First(handle, 4), Whole(Structure(4, "b"))) << "GetFirst begins again";
+  EXPECT_EQ(Next(handle, 17), "status 5") << "nothing is read after the end-of-table structure";
+  EXPECT_EQ(First(handle, 4), Whole(Structure(4, "b"))) << "GetFirst starts again from the beginning";
   EXPECT_EQ(Next(handle, 4), Whole(Structure(4, "d")));
 }
 
-TEST_F(SmbiosLibraryTest, GetNextOnAFreshHandleBeginsWithTheFirst) {
+TEST_F(SmbiosLibraryTest, GetNextOnANewHandleStartsWithTheFirstStructure) {
   THandle const handle = Open(Structure(4, "a") + Structure(4, "b"));
   EXPECT_EQ(Next(handle, 4), Whole(Structure(4, "a")));
   EXPECT_EQ(Next(handle, 4), Whole(Structure(4, "b")));
   EXPECT_EQ(Next(handle, 4), "status 5");
 }
 
-TEST_F(SmbiosLibraryTest, ASearchThatFindsNothingKeepsThePlace) {
+TEST_F(SmbiosLibraryTest, ASearchThatFindsNothingKeepsThePosition) {
   THandle const handle = Open(Structure(4, "a") + Structure(17, "b") + Structure(4, "c"));
   EXPECT_EQ(First(handle, 4), Whole(Structure(4, "a")));
   EXPECT_EQ(First(handle, 9), "status 5");

@@ -265,7 +265,7 @@ TEST_F(HostNamespaceTest, EmptySocketsAndSlotsHaveNoInstance) {
   EXPECT_EQ(TextOfOnly("CIM_Processor", "DeviceID"), "Processor 0");
   EXPECT_THAT(InstancesOf("CIM_PhysicalMemory"), IsEmpty());
   EXPECT_THAT(MissingOf("CIM_PhysicalMemory"), ElementsAre(": the firmware reports every memory slot as empty"));
-  EXPECT_THAT(MissingOf("CIM_Chassis"), ElementsAre(": the SMBIOS tables hold no structure of type 3 (Chassis)"));
+  EXPECT_THAT(MissingOf("CIM_Chassis"), ElementsAre(": the SMBIOS tables contain no structure of type 3 (Chassis)"));
 }
 
 TEST_F(HostNamespaceTest, AMissingKeyIsOmittedFromThePath) {

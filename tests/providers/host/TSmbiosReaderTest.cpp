@@ -20,7 +20,7 @@ using testing::IsEmpty;
 
 class TSmbiosReaderTest : public testing::Test {
 protected:
-  // Reads this table instead of the machine's.
+  // Makes a reader of this table.
   void Read(std::string const& table) {
     WriteFile(fDir.Path("table"), table);
     fGuard.reset();
@@ -33,7 +33,7 @@ protected:
     fReader = std::make_unique<TSmbiosReader>();
   }
 
-  // Text 1 of each structure of that type, whose first field numbers it.
+  // The text of each structure of that type. Its first field contains the number of the string.
   std::vector<std::string> TextsOf(int type) {
     std::vector<std::string> texts;
     for (TSmbiosStructure const& structure : fReader->All(type)) texts.push_back(*structure.Text(4));
@@ -45,7 +45,7 @@ protected:
   std::unique_ptr<TSmbiosReader> fReader;
 };
 
-TEST_F(TSmbiosReaderTest, AllStructuresOfATypeComeInTableOrder) {
+TEST_F(TSmbiosReaderTest, AllStructuresOfATypeAreReturnedInTableOrder) {
   Read(Structure(17, "\1", {"a"}) + Structure(4, "\1", {"other"}) + Structure(17, "\1", {"b"}) + Structure(17, "\1", {"c"}) +
        EndOfTable());
   EXPECT_THAT(TextsOf(17), ElementsAre("a", "b", "c"));
@@ -58,8 +58,8 @@ TEST_F(TSmbiosReaderTest, AMissingTypeHasItsReason) {
   Read(Structure(4, "\1", {"only"}) + EndOfTable());
   EXPECT_THAT(TextsOf(17), IsEmpty());
   EXPECT_EQ(fReader->WhyNone(17).fCode, "not-given");
-  EXPECT_EQ(fReader->WhyNone(17).fReason, "the SMBIOS tables hold no structure of type 17 (Memory Device)");
-  EXPECT_EQ(fReader->First(1).Text(4).Why().fReason, "the SMBIOS tables hold no structure of type 1 (System Information)");
+  EXPECT_EQ(fReader->WhyNone(17).fReason, "the SMBIOS tables contain no structure of type 17 (Memory Device)");
+  EXPECT_EQ(fReader->First(1).Text(4).Why().fReason, "the SMBIOS tables contain no structure of type 1 (System Information)");
 }
 
 TEST_F(TSmbiosReaderTest, ManyStructuresAreAllRead) {
@@ -75,10 +75,10 @@ TEST_F(TSmbiosReaderTest, ALargeStructureIsRead) {
   Read(Structure(1, "\1", {std::string(60000, 'x')}) + EndOfTable());
   EXPECT_EQ(*fReader->First(1).Text(4), std::string(60000, 'x'));
   Read(Structure(1, "\1", {std::string(70000, 'x')}) + EndOfTable());
-  EXPECT_EQ(fReader->First(1).Text(4).Why().fCode, "unexpected-form") << "cut, so that the text has no end";
+  EXPECT_EQ(fReader->First(1).Text(4).Why().fCode, "unexpected-form") << "the structure is truncated, so the string has no end";
 }
 
-TEST_F(TSmbiosReaderTest, ATableFileThatCannotBeReadSaysWhy) {
+TEST_F(TSmbiosReaderTest, AnUnusableTableFileIsTheReason) {
   ReadFrom(fDir.Path("nothing"));
   EXPECT_EQ(fReader->WhyNone(1).fCode, "unreadable");
   EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file " + fDir.Path("nothing") + " does not exist");
@@ -86,17 +86,17 @@ TEST_F(TSmbiosReaderTest, ATableFileThatCannotBeReadSaysWhy) {
   EXPECT_EQ(fReader->First(1).Byte(4).Why().fReason, fReader->WhyNone(1).fReason);
 
   ReadFrom(fDir.Path());
-  EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file " + fDir.Path() + " holds no SMBIOS table");
+  EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file " + fDir.Path() + " does not contain an SMBIOS table");
   Read("");
-  EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file " + fDir.Path("table") + " holds no SMBIOS table");
+  EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file " + fDir.Path("table") + " does not contain an SMBIOS table");
 }
 
-TEST_F(TSmbiosReaderTest, ATableFileThatCannotBeReadIsNotTakenForOneWithoutATable) {
+TEST_F(TSmbiosReaderTest, AReadErrorIsNotReportedAsAFileWithoutATable) {
   ReadFrom("/proc/self/mem");
   EXPECT_EQ(fReader->WhyNone(1).fCode, "unreadable");
   EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file /proc/self/mem cannot be read: Input/output error");
 
-  Read(EndOfTable());  // the library is loaded from now on
+  Read(EndOfTable());  // fReader keeps the library loaded
   TSharedLibrary const library(::dlopen("libsmbios.so", RTLD_NOW));
   ASSERT_TRUE(library) << ::dlerror();
   WriteFile(fDir.Path("other"), EndOfTable());
@@ -110,7 +110,7 @@ TEST_F(TSmbiosReaderTest, ATableFileThatCannotBeReadIsNotTakenForOneWithoutATabl
   EXPECT_EQ(fReader->WhyNone(1).fReason, "the SMBIOS table file " + fDir.Path("other") + " cannot be read: Too many open files");
 }
 
-TEST_F(TSmbiosReaderTest, TheSourceTellsAFile) {
+TEST_F(TSmbiosReaderTest, TheSourceMarksATableFile) {
   Read(EndOfTable());
   EXPECT_EQ(fReader->SourceOf(17), "SMBIOS type 17 (file)");
   ReadFrom("");
@@ -132,7 +132,7 @@ TEST_F(TSmbiosReaderTest, TheRealTablesHaveTheirStructures) {
   EXPECT_EQ(fReader->All(17).size(), 8u);
 }
 
-// ---- With a stand-in, which is loaded first and bears the library's name ----
+// ---- With a stand-in that has the library's name and is loaded first ----
 
 class FakeSmbiosTest : public testing::Test {
 protected:
@@ -152,16 +152,16 @@ protected:
   std::unique_ptr<TSmbiosReader> fReader;
 };
 
-TEST_F(FakeSmbiosTest, TheLibrarysStatusTellsWhy) {
+TEST_F(FakeSmbiosTest, TheLibrarysStatusIsTheReason) {
   struct TRow {
     char const *behaviour, *code, *reason;
   } const rows[] = {
-      {"finds no file", "no-smbios", "no SMBIOS tables exported"},
+      {"is missing its file", "no-smbios", "no SMBIOS tables exported"},
       {"is denied access", "needs-root", "needs root (SMBIOS tables)"},
       {"fails", "unreadable", "the system's SMBIOS tables cannot be read"},
       {"cannot read", "unreadable", "the system's SMBIOS tables cannot be read: Input/output error"},
-      {"cannot read and tells no reason", "unreadable", "the system's SMBIOS tables cannot be read"},
-      {"hands out no handle", "unreadable", "the system's SMBIOS tables cannot be read"},
+      {"cannot read and leaves no errno", "unreadable", "the system's SMBIOS tables cannot be read"},
+      {"returns no handle", "unreadable", "the system's SMBIOS tables cannot be read"},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.behaviour);
@@ -173,7 +173,7 @@ TEST_F(FakeSmbiosTest, TheLibrarysStatusTellsWhy) {
   }
 }
 
-TEST_F(FakeSmbiosTest, WithoutGetNextTheFirstStructureIsAll) {
+TEST_F(FakeSmbiosTest, WithoutGetNextOnlyTheFirstStructureIsRead) {
   Load(FAKE_SMBIOS_WITHOUT_NEXT, "works");
   ASSERT_EQ(fReader->All(1).size(), 1u);
   EXPECT_EQ(*fReader->All(1)[0].Text(5), "first");
@@ -182,19 +182,19 @@ TEST_F(FakeSmbiosTest, WithoutGetNextTheFirstStructureIsAll) {
 TEST_F(FakeSmbiosTest, WithGetNextTheOthersFollow) {
   Load(FAKE_SMBIOS, "works");
   ASSERT_EQ(fReader->All(1).size(), 3u);
-  EXPECT_EQ(fReader->All(1).size(), 1u) << "the stand-in has handed out both";
+  EXPECT_EQ(fReader->All(1).size(), 1u) << "the stand-in has already returned its two further structures";
 }
 
-TEST_F(FakeSmbiosTest, NoLengthOfTheLibraryIsTrustedBeyondTheBuffer) {
-  Load(FAKE_SMBIOS, "lies about the length");
+TEST_F(FakeSmbiosTest, ALengthOutsideTheBufferIsLimitedToTheBuffer) {
+  Load(FAKE_SMBIOS, "reports too large a length");
   EXPECT_EQ(*fReader->First(1).Text(5), "first");
-  Load(FAKE_SMBIOS, "says no length");
+  Load(FAKE_SMBIOS, "reports the length 0");
   EXPECT_EQ(fReader->First(1).Text(5).Why().fCode, "not-given");
-  Load(FAKE_SMBIOS, "says a negative length");
+  Load(FAKE_SMBIOS, "reports a negative length");
   EXPECT_EQ(fReader->First(1).Text(5).Why().fCode, "not-given");
 }
 
-TEST_F(FakeSmbiosTest, ALibraryThatNeverEndsIsLeft) {
+TEST_F(FakeSmbiosTest, ALibraryThatNeverEndsIsReadUpToALimit) {
   Load(FAKE_SMBIOS, "never ends");
   EXPECT_EQ(fReader->All(1).size(), 4096u);
 }

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// A stand-in for libsmbios.so, with the behaviour that the environment variable FAKE_SMBIOS names. Built with
-// FAKE_WITHOUT_NEXT it lacks smBiosGetNext, as a library may.
+// A stand-in for libsmbios.so. The environment variable FAKE_SMBIOS names its behaviour. When built with FAKE_WITHOUT_NEXT, it
+// lacks smBiosGetNext, which is optional.
 
 #include "platform/include/smbios.h"
 
@@ -20,15 +20,15 @@ bool Is(char const* behaviour) {
   return chosen != nullptr && std::strcmp(chosen, behaviour) == 0;
 }
 
-int Hand(char const* text, void* buffer, int* length) {
+int CopyStructure(char const* text, void* buffer, int* length) {
   std::string structure("\x01\x08\0\0\0\1\0\0", 8);
   structure += text;
   structure += std::string(2, '\0');
-  if (Is("lies about the length"))
+  if (Is("reports too large a length"))
     *length = 1 << 30;
-  else if (Is("says no length"))
+  else if (Is("reports the length 0"))
     *length = 0;
-  else if (Is("says a negative length"))
+  else if (Is("reports a negative length"))
     *length = -5;
   else
     *length = static_cast<int>(structure.size());
@@ -41,11 +41,11 @@ int Hand(char const* text, void* buffer, int* length) {
 #pragma GCC visibility push(default)
 
 int smBiosLoad(void*, void** handle) {
-  *handle = Is("hands out no handle") ? nullptr : &gHandle;
-  if (Is("finds no file")) return kSmbiosFileNotFound;
+  *handle = Is("returns no handle") ? nullptr : &gHandle;
+  if (Is("is missing its file")) return kSmbiosFileNotFound;
   if (Is("is denied access")) return kSmbiosAccessDenied;
   if (Is("fails")) return kSmbiosFail;
-  if (Is("cannot read") || Is("cannot read and tells no reason")) {
+  if (Is("cannot read") || Is("cannot read and leaves no errno")) {
     errno = Is("cannot read") ? EIO : 0;
     return kSmbiosFileSystemError;
   }
@@ -54,14 +54,14 @@ int smBiosLoad(void*, void** handle) {
 
 int smBiosGetFirst(void*, int, void* buffer, int* length) {
   if (Is("has no structure")) return kSmbiosNoMoreItems;
-  return Hand("first", buffer, length);
+  return CopyStructure("first", buffer, length);
 }
 
 #ifndef FAKE_WITHOUT_NEXT
 int smBiosGetNext(void*, int, void* buffer, int* length) {
-  static int handed = 0;
-  if (Is("never ends")) return Hand("again", buffer, length);
-  return handed++ < 2 ? Hand("next", buffer, length) : static_cast<int>(kSmbiosNoMoreItems);
+  static int copied = 0;
+  if (Is("never ends")) return CopyStructure("again", buffer, length);
+  return copied++ < 2 ? CopyStructure("next", buffer, length) : static_cast<int>(kSmbiosNoMoreItems);
 }
 #endif
 

@@ -292,7 +292,7 @@ TEST_F(ReportTest, AnUnreadableTableFileHasAReason) {
 
   TRun const garbage = Report(fZep.Table("_SM_ and no more"));
   EXPECT_EQ(garbage.status, 2);
-  EXPECT_THAT(LinesOf(garbage.output)[0], EndsWith(" holds no SMBIOS table"));
+  EXPECT_THAT(LinesOf(garbage.output)[0], EndsWith(" does not contain an SMBIOS table"));
 }
 
 TEST_F(ReportTest, ATableFileOfAnotherUserHasAReason) {
@@ -306,7 +306,8 @@ TEST_F(ReportTest, ATableFileOfAnotherUserHasAReason) {
   TRun const run = fZep.Run(call);
   EXPECT_EQ(run.status, 2);
   ASSERT_FALSE(run.output.empty());
-  EXPECT_EQ(LinesOf(run.output)[0], "db1: not identified: the SMBIOS table file " + table + " may not be read by this user");
+  EXPECT_EQ(LinesOf(run.output)[0],
+            "db1: not identified: the SMBIOS table file " + table + " cannot be read: this user lacks the permission");
 }
 
 TEST_F(ReportTest, UnreadableSystemTablesHaveAReason) {
@@ -314,7 +315,7 @@ TEST_F(ReportTest, UnreadableSystemTablesHaveAReason) {
   struct TRow {
     char const *behaviour, *machine, *code;
   } const rows[] = {
-      {"finds no file", "db1: not identified: no SMBIOS tables exported", "no-smbios"},
+      {"is missing its file", "db1: not identified: no SMBIOS tables exported", "no-smbios"},
       {"is denied access", "db1: not identified: needs root (SMBIOS tables)", "needs-root"},
       {"fails", "db1: not identified: the system's SMBIOS tables cannot be read", "unreadable"},
   };
