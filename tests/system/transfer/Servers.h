@@ -5,14 +5,47 @@
 
 #include "tests/os/HostTools.h"
 
+#include <arpa/inet.h>
+#include <netinet/in.h>
 #include <signal.h>
 #include <sys/prctl.h>
+#include <sys/socket.h>
 
 #include <chrono>
 #include <cstdlib>
 #include <map>
 
 namespace NQRVZEP20 {
+
+// Waits until the condition is true, for at most two minutes: a machine under load is slow, and a test should fail rather than
+// wait for ever. Returns whether it is true.
+template <class TCondition>
+bool IsTrueSoon(TCondition const& condition) {
+  constexpr int kTries = 24000;
+  for (int tries = 0; tries < kTries; ++tries, ::usleep(5000))
+    if (condition()) return true;
+  return condition();
+}
+
+// A TCP port of loopback that refuses connections. No other program gets it while the object exists.
+class TClosedPort {
+public:
+  TClosedPort() : fSocket(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0)) {
+    sockaddr_in name{};
+    name.sin_family = AF_INET;
+    name.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+    socklen_t size = sizeof name;
+    auto* const address = reinterpret_cast<sockaddr*>(&name);
+    if (::bind(fSocket.get(), address, size) != 0 || ::getsockname(fSocket.get(), address, &size) != 0)
+      throw std::runtime_error("no port");
+    fNumber = std::to_string(ntohs(name.sin_port));
+  }
+  std::string const& Number() const { return fNumber; }
+
+private:
+  TUniqueFd fSocket;
+  std::string fNumber;
+};
 
 // A script of tests/system/transfer/servers, which runs from the construction to the destruction. It prints one line of
 // NAME=VALUE words when it is ready. A port that somebody else was quicker to take is no failure: it tries again.

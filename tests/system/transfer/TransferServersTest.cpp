@@ -152,9 +152,8 @@ TEST_P(FileServerTest, ADownloadMakesMissingDirectoriesOnAnFtpServerToo) {
 }
 
 TEST_P(FileServerTest, NobodyThereIsAFailedConnection) {
-  std::string const file = LocalFile("text"), port = fServer->Port();
-  fServer.reset();  // no server listens on that port any more
-  std::string const unanswered = GetParam() + "://zep:secret@127.0.0.1:" + port + "/f";
+  TClosedPort const port;
+  std::string const file = LocalFile("text"), unanswered = GetParam() + "://zep:secret@127.0.0.1:" + port.Number() + "/f";
   ExpectFailure([&] { Put(unanswered, file); }, kZEPStatusConnectionFailed, {kConnecting});
   ExpectFailure([&] { Get(unanswered, fDir.Path("down")); }, kZEPStatusConnectionFailed, {kConnecting});
 
@@ -302,8 +301,8 @@ TEST_F(ProxyServerTest, ARefusalIsSeenInTheContentOnly) {
 
 TEST_F(ProxyServerTest, NoProxyIsAFailedConnection) {
   using testing::Pair;
-  std::string const port = fProxy->Port();
-  fProxy.reset();
+  TClosedPort const closed;
+  std::string const& port = closed.Number();
   EXPECT_THAT(LogOf([&] { EXPECT_THAT(Check("127.0.0.1", port, "zep:secret"), Pair("kZEPStatusConnectionFailed", "")); }),
               ElementsAre(testing::StartsWith("[Error] TOSSpecific|CheckProxySetting: curl_easy_perform FAILed;Failed to connect "
                                               "to 127.0.0.1 port " +

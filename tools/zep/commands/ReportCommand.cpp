@@ -144,7 +144,7 @@ TRun AddReportArguments(CLI::App& command) {
                      "Also send the JSON document, compressed: ftp://[USER@]HOST[:PORT]/DIRECTORY/, sftp://..., or\n"
                      "[USER@]HOST[:PORT] alone. A report that cannot be sent is kept in a file, whose path is printed");
   command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
-  AddTransferOptions(command, arguments->fOptions);
+  AddUploadOptions(command, arguments->fOptions);
   command.footer(
       "Exit status: 0 when the identity is complete (the details do not count), 2 when a part of it is missing or a\n"
       "plug-in failed, 1 when no part of it is known or the medium could not be written and unmounted, 64 for wrong\n"

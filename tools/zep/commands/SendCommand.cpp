@@ -44,7 +44,7 @@ TRun AddSendArguments(CLI::App& command) {
                      "The name on the server, instead of the file's own, for a host or a URL that ends in \"/\"");
   command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
-  AddTransferOptions(command, arguments->fOptions);
+  AddUploadOptions(command, arguments->fOptions);
   command.footer(
       "Missing directories are created on the server. The file is sent under a temporary name, which ends in a number and\n"
       "\".part\", and is renamed when the upload is complete. A file or link of that name is then replaced by a new file, a\n"

@@ -160,16 +160,21 @@ TRemote PlaceOf(TTarget const& target) {
   return place;
 }
 
-// How long a server has to remove what a broken transfer left: less than a standstill takes.
+// How long a server has to remove what a failed upload left. The usual time is shorter than a standstill.
 int CleanUpSecondsOf(TTransferOptions const& options) {
   constexpr int kMost = 10;
+  if (options.fCleanUpSeconds > 0) return options.fCleanUpSeconds;
   return options.fStallSeconds > 0 ? std::clamp(options.fStallSeconds / 2, 1, kMost) : kMost;
 }
 
-// Removes what an upload left whose process was ended, where the server can be reached soon. One more interrupt ends the wait.
-void CleanUp(TRemote const& place, TUploadNames const& names, int seconds, TTransferState& state) {
+// How long the clean-up may take after zep has ended the process of the upload: the user is waiting.
+int CleanUpSecondsAfterEnd(TTransferOptions const& options) {
   constexpr int kMost = 5;
-  int const limit = std::min(seconds, kMost);
+  return options.fCleanUpSeconds > 0 ? options.fCleanUpSeconds : std::min(CleanUpSecondsOf(options), kMost);
+}
+
+// Removes what an upload left whose process was ended. One more interrupt ends the wait.
+void CleanUp(TRemote const& place, TUploadNames const& names, int limit, TTransferState& state) {
   TChildProcess const child(
       [&] {
         RemoveParts(place, names, limit, state);
@@ -358,6 +363,15 @@ void AddTransferOptions(CLI::App& command, TTransferOptions& options) {
   command.add_option("--netrc", options.fNetrc, "The file with users and passwords ($NETRC, else ~/.netrc)");
 }
 
+void AddUploadOptions(CLI::App& command, TTransferOptions& options) {
+  AddTransferOptions(command, options);
+  command
+      .add_option("--clean-up", options.fCleanUpSeconds,
+                  "The longest time for removing an incomplete file from the server after a failure, in seconds (10;\n"
+                  "after a stall or an interrupt 5)")
+      ->check(CLI::Range(1, 3600));
+}
+
 void AddSizeOption(CLI::App& command, std::string const& name, std::uint64_t& bytes, std::string const& description) {
   CLI::Validator const check([&bytes](std::string& text) { return WhyNoSize(text, bytes); }, "SIZE, such as 500K, 2M or 1G");
   command
@@ -403,7 +417,8 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
       Transfer([&] { return Upload(place, names, file, cleanUpSeconds, *state); }, *state, transferred.fBytes, options);
   EExitStatus const exit = transferred.fOutcome.fExit;
   bool const wasEnded = exit == kExitStalled || exit >= kExitHangUp;
-  if (wasEnded && (state->fLeft & (kLeftTemporary | kLeftAtPlace))) CleanUp(place, names, cleanUpSeconds, *state);
+  if (wasEnded && (state->fLeft & (kLeftTemporary | kLeftAtPlace)))
+    CleanUp(place, names, CleanUpSecondsAfterEnd(options), *state);
   ExplainNoConnection(transferred.fOutcome, place);
   ExplainUpload(transferred, place, names, *state);
   if (exit != kExitComplete) return transferred;

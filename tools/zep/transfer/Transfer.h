@@ -24,9 +24,13 @@ struct TTransferOptions {
   int fStallSeconds = kUsualStallSeconds;
   std::string fNetrc;
   std::uint64_t fMostBytes = kUsualMostBytes;  // of a file that is fetched; 0: any size
+  int fCleanUpSeconds = 0;                     // for removing what a failed upload left on the server; 0: the usual time
 };
 
 void AddTransferOptions(CLI::App& command, TTransferOptions& options);
+
+// The same, and those of commands that send.
+void AddUploadOptions(CLI::App& command, TTransferOptions& options);
 
 // An option that takes a number of bytes, or one of KiB, MiB, GiB or TiB with "K", "M", "G" or "T" behind it.
 void AddSizeOption(CLI::App& command, std::string const& name, std::uint64_t& bytes, std::string const& description);
