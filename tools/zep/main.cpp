@@ -137,7 +137,8 @@ std::string WhyNoValue(CLI::App const& chosen, std::string const& message) {
 std::string WhyRefused(CLI::App const& app, CLI::ParseError const& refusal) {
   CLI::App const& chosen = ChosenOf(app);
   std::string const message = refusal.what();
-  if (&chosen == &app && dynamic_cast<CLI::RequiredError const*>(&refusal)) return "no command is named; zep --help lists them";
+  if (&chosen == &app && dynamic_cast<CLI::RequiredError const*>(&refusal))
+    return "a command is required; zep --help lists all commands";
   bool const isOfValue =
       dynamic_cast<CLI::ValidationError const*>(&refusal) || dynamic_cast<CLI::ConversionError const*>(&refusal);
   return isOfValue ? WhyNoValue(chosen, message) : message;

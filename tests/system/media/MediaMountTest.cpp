@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// MountDevice and UnmountDevice with real images. Regular files serve as devices here: mount takes a loop device by itself.
+// Tests MountDevice and UnmountDevice with real images. Regular files serve as devices: mount sets up a loop device itself.
 
 #include "tests/system/media/MediaSupport.h"
 
 namespace NQRVZEP20 {
 namespace {
 
-// What the function returns in a child that has mount points of its own.
+// Returns the result of the function, which is run in a child that has private mount points.
 template <class TFunction>
 std::string WithMountPoints(TFunction function) {
   return InChild([&] {
@@ -30,7 +30,7 @@ protected:
   void SetUp() override {
     NEEDS_IMAGES();
     MakeImage(fDir.Path("key"), "whole");
-    MakeImage(fDir.Path("part1"), "partition");  // of the "device" part, which itself cannot be mounted
+    MakeImage(fDir.Path("part1"), "partition");  // the first partition of the "device" part, which itself cannot be mounted
     WriteFile(fDir.Path("part"), std::string(4096, '\0'));
   }
 
@@ -56,7 +56,7 @@ TEST_F(MediaMountTest, AFirstPartitionIsMountedWhenTheDeviceHasNoFileSystem) {
             "/mnt/key partition");
 }
 
-TEST_F(MediaMountTest, AMountedKeyStaysEvenForAnotherDevice) {
+TEST_F(MediaMountTest, AMountedKeyIsNotReplacedByAnotherDevice) {
   EXPECT_EQ(WithMountPoints([&] {
               TOSSpecific::MountDevice(fKey);
               std::string const mounts = ReadFile("/proc/self/mounts");
@@ -67,15 +67,15 @@ TEST_F(MediaMountTest, AMountedKeyStaysEvenForAnotherDevice) {
             "/mnt/key whole unchanged");
 }
 
-TEST_F(MediaMountTest, AKeyIsNoHindranceToAFloppy) {
+TEST_F(MediaMountTest, AMountedKeyDoesNotPreventMountingAFloppy) {
   EXPECT_EQ(WithMountPoints([&] {
               TOSSpecific::MountDevice(fKey);
-              return StatusOf([] { TOSSpecific::MountDevice("/dev/fd1"); });  // there is none, and so it was tried
+              return StatusOf([] { TOSSpecific::MountDevice("/dev/fd1"); });  // missing: the failure shows that it was tried
             }),
             "kZEPStatusFileSystemError");
 }
 
-TEST_F(MediaMountTest, WhatCannotBeMountedThrows) {
+TEST_F(MediaMountTest, AFailureToMountThrows) {
   struct TRow {
     char const* what;
     std::function<void()> prepare;
@@ -83,8 +83,8 @@ TEST_F(MediaMountTest, WhatCannotBeMountedThrows) {
   };
   TRow const rows[] = {
       {"no file system", [] {}, "/dev/null"},
-      {"a device that is not there", [] {}, fDir.Path("nothing")},
-      {"a device that goes away", [&] { std::filesystem::remove(fKey); }, fKey},
+      {"a missing device", [] {}, fDir.Path("nothing")},
+      {"a device that is removed", [&] { std::filesystem::remove(fKey); }, fKey},
       {"no mount point", [] { std::filesystem::remove("/mnt/key"); }, fKey},
   };
   for (TRow const& row : rows)
@@ -96,7 +96,7 @@ TEST_F(MediaMountTest, WhatCannotBeMountedThrows) {
         << row.what;
 }
 
-TEST_F(MediaMountTest, ABusyMountPointAndOneWithoutMediumCannotBeUnmounted) {
+TEST_F(MediaMountTest, ABusyOrUnusedMountPointCannotBeUnmounted) {
   EXPECT_EQ(WithMountPoints([&] {
               std::string text = StatusOf([] { TOSSpecific::UnmountDevice("", "/mnt/key"); });
               TOSSpecific::MountDevice(fKey);

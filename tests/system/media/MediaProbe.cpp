@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Does one operation on removable media and prints what came of it. Run in a virtual machine that has some.
+// Runs one operation on removable media, in a virtual machine that has some, and prints the result.
 //
 //   MediaProbe virtual KIND KEEPWHOLE  the controller's virtual devices
-//   MediaProbe enumerate [COMMAND]     what the host provider's namespace leads to; COMMAND is run once it is filled
-//   MediaProbe ids DEVICEID...         the same for a namespace of disks with these identifiers
+//   MediaProbe enumerate [COMMAND]     the media found by the host provider's namespace; COMMAND is run after it is filled
+//   MediaProbe ids DEVICEID...         the media found by a namespace of disks with these identifiers
 //   MediaProbe mount DEVICE
 //   MediaProbe umount DEVICE DIRECTORY
 //   MediaProbe eject DEVICE            opens the tray of an optical drive

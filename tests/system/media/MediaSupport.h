@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// Real media for tests: images on loop devices, mounted in a mount namespace of a child process.
+// Real media for tests: images on loop devices, mounted in the mount namespace of a child process.
 
 #include "tests/os/HostTools.h"
 #include "tests/os/Programs.h"
@@ -14,21 +14,21 @@
 
 namespace NQRVZEP20 {
 
-// Runs a command of the shell and throws, with what it printed, when it fails.
+// Runs a shell command. Throws, with its output, when it fails.
 inline std::string Do(std::string const& command) {
   TProgramRun const run = RunProgram("(" + command + ") 2>&1");
   if (run.exitCode != 0) throw std::runtime_error(command + ": " + run.output);
   return run.output;
 }
 
-// For use in a child: /mnt is a file system of the child's own, with the two directories for media.
+// For use in a child: makes /mnt and /run private file systems of the child; /mnt has the two directories for media.
 inline void MakeMountPoints() {
   if (!MountTmpfs("/mnt", "") || !MountTmpfs("/run", "")) throw std::runtime_error("cannot mount");
   std::filesystem::create_directory("/mnt/key");
   std::filesystem::create_directory("/mnt/floppy");
 }
 
-// An image with an ext4 file system that holds the file label.txt with this text.
+// Creates an image with an ext4 file system that contains the file label.txt with this text.
 inline void MakeImage(std::string const& path, std::string const& label, std::string const& size = "4M") {
   TTempDir const content;
   WriteFile(content.Path("label.txt"), label);
@@ -36,7 +36,7 @@ inline void MakeImage(std::string const& path, std::string const& label, std::st
   Do("/usr/sbin/mke2fs -q -F -t ext4 -m 0 -d " + content.Path() + " " + path);
 }
 
-// A loop device with an image, as long as it lives.
+// A loop device with an image. It is detached by the destructor.
 class TLoopDevice {
 public:
   explicit TLoopDevice(std::string const& image, std::string const& options = "") {
@@ -53,14 +53,14 @@ private:
   std::string fPath;
 };
 
-// Loop devices belong to the whole machine: other tests of this kind, also those of another build tree, wait until this
+// Loop devices are shared by the whole machine: other tests of this kind, also those of another build tree, wait until this
 // process has ended.
 inline bool HasLoopDevicesForItself() {
   static int const lock = ::open("/dev/loop-control", O_RDONLY | O_CLOEXEC);
   return lock >= 0 && ::flock(lock, LOCK_EX) == 0;
 }
 
-// Whether images can be mounted here.
+// Whether this process can mount images.
 inline bool MayMountImages() {
   return MayMount() && HasLoopDevicesForItself() &&
          RunProgram("/usr/sbin/losetup --find >/dev/null 2>&1 && test -x /usr/sbin/mke2fs").exitCode == 0;

@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Removable media for real: a virtual machine with a SCSI disk, a USB stick, a CD-ROM, a floppy drive and what a management
-// controller shows to its host. It is booted once and does everything (in-vm.sh); the tests look at what it left.
+// Tests with real removable media: a virtual machine has a SCSI disk, a USB stick, a CD-ROM, a floppy drive and the devices that
+// a management controller shows to its host. It is booted once and runs everything (in-vm.sh); each test checks one of the
+// results.
 
 #include "tests/Support.h"
 #include "tests/os/Programs.h"
@@ -60,7 +61,7 @@ protected:
   static inline TProgramRun gRun{"", -1};
 
 private:
-  // Taken along, with the libraries that are linked.
+  // The files that are copied into the machine, each program with the libraries that it links.
   static std::string Files() {
     std::string files;
     for (char const* program : {"hwinfo", "lsblk", "blkid"}) {
@@ -93,7 +94,7 @@ TEST_F(MediaVmTest, UsbDisksAndTheFloppyDriveAreEnumerated) {
             "/dev/sdb1 /mnt/key vfat\n");
 }
 
-TEST_F(MediaVmTest, DisksAreMatchedByAddressOrGenericNode) {
+TEST_F(MediaVmTest, DisksAreFoundByAddressOrGenericNode) {
   EXPECT_EQ(Result("ids"),
             "/dev/sdc|Maker Disk|/mnt/key\n"
             "/dev/sdc|Maker Disk|/mnt/key\n"
@@ -114,11 +115,11 @@ TEST_F(MediaVmTest, DevicesAreMountedWholeOrByTheirFirstPartition) {
             "kZEPStatusFileSystemError\n");
 }
 
-TEST_F(MediaVmTest, AMountedKeyWillDoForAnotherAndIsUnmountedByItsMountPoint) {
+TEST_F(MediaVmTest, AMountedKeyIsAcceptedForAnotherDeviceAndUnmountedByItsMountPoint) {
   EXPECT_EQ(Result("second-key"), "/mnt/key\n/mnt/key\n/dev/sdb1 /mnt/key vfat\nkZEPStatusFileSystemError\n");
 }
 
-TEST_F(MediaVmTest, ADiskThatVanishedSinceItWasListedIsPassedOver) {
+TEST_F(MediaVmTest, ADiskThatVanishesAfterTheListingIsSkipped) {
   EXPECT_EQ(Result("vanished"),
             "/dev/sdb|QEMU QEMU HARDDISK|/mnt/key\n"
             "/dev/fd0|Built-in Floppy Drive|/mnt/floppy\n"
@@ -149,7 +150,7 @@ TEST_F(MediaVmTest, ZepListsMediaWithLabelAndMountPoint) {
   EXPECT_EQ(MediumIn(mounted, "/dev/sdc")["mounted"], false);
 }
 
-TEST_F(MediaVmTest, AnEmptyOpticalDriveIsNoMedium) {
+TEST_F(MediaVmTest, AnEmptyOpticalDriveIsNotListed) {
   std::string const full = Result("list-full.json"), empty = Result("list-empty.json");
   EXPECT_EQ(MediumIn(full, "/dev/sr0")["description"], "QEMU CD-ROM");
   EXPECT_TRUE(MediumIn(empty, "/dev/sr0").is_null()) << empty;
@@ -157,21 +158,21 @@ TEST_F(MediaVmTest, AnEmptyOpticalDriveIsNoMedium) {
 }
 
 TEST_F(MediaVmTest, ZepMountsAndUnmounts) {
-  EXPECT_EQ(Result("zep-mount"), "/dev/sdb1 is mounted at /mnt/key\n/mnt/key is unmounted; the medium can be taken out\n");
+  EXPECT_EQ(Result("zep-mount"), "/dev/sdb1 is mounted at /mnt/key\n/mnt/key is unmounted; the medium can be removed\n");
 }
 
 TEST_F(MediaVmTest, AReportIsReadBackFromTheStick) {
   EXPECT_THAT(Result("report"), StartsWith("The report is zep-report-sample-server-"));
-  EXPECT_THAT(Result("report"), HasSubstr(".txt on /dev/sdb1, which can be taken out.\nexit status 2\nSAMPLE sample-server: "));
+  EXPECT_THAT(Result("report"), HasSubstr(".txt on /dev/sdb1, which can be removed.\nexit status 2\nSAMPLE sample-server: "));
   EXPECT_THAT(Result("report"), HasSubstr("filled root/zep/host\n"));
 }
 
-// Tells no success and leaves no report.
+// Expects that success is not reported and that no report is left.
 void ExpectFailure(std::string const& text, std::string const& reason) {
   EXPECT_THAT(text, StartsWith("zep: zep-report-sample-server-"));
-  EXPECT_THAT(text, HasSubstr(" cannot be written on /dev/sdc: " + reason));
+  EXPECT_THAT(text, HasSubstr(" cannot be written to /dev/sdc: " + reason));
   EXPECT_THAT(text, HasSubstr("\nexit status 1\n"));
-  EXPECT_THAT(text, Not(HasSubstr("can be taken out")));
+  EXPECT_THAT(text, Not(HasSubstr("can be removed")));
 }
 
 TEST_F(MediaVmTest, AFullMediumIsAFailure) {
@@ -184,14 +185,14 @@ TEST_F(MediaVmTest, AReadOnlyMediumIsAFailure) {
   EXPECT_THAT(Result("read-only"), EndsWith("\nexit status 1\n"));
 }
 
-TEST_F(MediaVmTest, AMediumPulledOutInTheMiddleIsAFailure) {
+TEST_F(MediaVmTest, AMediumPulledOutDuringTheWriteIsAFailure) {
   for (std::string const sync : {"1", "2"}) {
     SCOPED_TRACE(sync);
     std::string const text = Result("pulled-out-" + sync);
     ExpectFailure(text, "");
     std::string const left = text.substr(text.find("exit status 1\n") + 14);
     EXPECT_THAT(left, Not(HasSubstr(".txt\n")));
-    EXPECT_THAT(left, Not(HasSubstr("/dev/sdc")));  // not mounted any more
+    EXPECT_THAT(left, Not(HasSubstr("/dev/sdc")));  // no longer mounted
   }
 }
 

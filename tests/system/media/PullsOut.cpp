@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// To be preloaded: just before the ZEP_PULL_ATth fsync of the process, runs the shell command ZEP_PULL or raises the signal
-// ZEP_RAISE.
+// A library to be preloaded. Immediately before the fsync whose number is ZEP_PULL_AT, counted from 1, it runs the shell command
+// ZEP_PULL or raises the signal ZEP_RAISE.
 
 #include <dlfcn.h>
 #include <signal.h>

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// zep media and zep report --to-media on loop devices, and media that fail.
+// Tests zep media and zep report --to-media with loop devices, and with media that fail.
 
 #include "ZEPExport.h"
 #include "tests/system/media/MediaSupport.h"
@@ -21,7 +21,7 @@ namespace {
 int gRenameError = 0;
 }
 
-// Found before that of the C library: fails with gRenameError, if there is one, as file systems in user space do.
+// Replaces the function of the C library. Fails with gRenameError unless it is 0, as on some file systems in user space.
 ZEP_EXPORT int renameat2(int oldDirectory, char const* oldName, int newDirectory, char const* newName, unsigned flags) noexcept {
   if (gRenameError != 0) {
     errno = gRenameError;
@@ -43,7 +43,7 @@ class ZepMediaTest : public testing::Test {
 protected:
   void SetUp() override { NEEDS_IMAGES(); }
 
-  // In a child, with zep at hand.
+  // Runs the function in a child that has an installation of zep and private mount points.
   template <class TFunction>
   std::string WithZep(TFunction function) {
     return InChild([&] {
@@ -70,7 +70,7 @@ protected:
       if (entry.path().filename() != "lost+found") names.push_back(entry.path().filename());
     return names;
   }
-  // What an image holds, read through another mount.
+  // The names of the files in an image, read through another mount.
   static std::vector<std::string> NamesIn(std::string const& image) {
     fs::create_directory("/mnt/look");
     Do("mount -o ro,noload " + image + " /mnt/look");
@@ -108,7 +108,7 @@ TEST_F(ZepMediaTest, MountsAndUnmounts) {
             }),
             "LOOP is mounted at /mnt/key\nexit status 0\nwhole\n"
             "LOOP is mounted at /mnt/key\nexit status 0\n"
-            "/mnt/key is unmounted; the medium can be taken out\nexit status 0\n"
+            "/mnt/key is unmounted; the medium can be removed\nexit status 0\n"
             "zep: nothing is mounted at /mnt/key\nexit status 1\n");
 }
 
@@ -126,10 +126,10 @@ TEST_F(ZepMediaTest, MountsForACallerThatIgnoresItsChildren) {
               }
               return Replaced(text, loop.Path(), "LOOP");
             }),
-            "LOOP is mounted at /mnt/key\n/mnt/key is unmounted; the medium can be taken out\n");
+            "LOOP is mounted at /mnt/key\n/mnt/key is unmounted; the medium can be removed\n");
 }
 
-TEST_F(ZepMediaTest, WithoutTheProgramMountThePackageIsNamed) {
+TEST_F(ZepMediaTest, WithoutTheProgramMountItsPackageIsNamed) {
   MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
               TLoopDevice const loop(fDir.Path("key"));
@@ -141,7 +141,7 @@ TEST_F(ZepMediaTest, WithoutTheProgramMountThePackageIsNamed) {
             "zep: the program mount is missing; install the package mount\n1");
 }
 
-TEST_F(ZepMediaTest, MakesTheMountPointAndPrintsJson) {
+TEST_F(ZepMediaTest, CreatesTheMountPointAndPrintsJson) {
   MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
               fs::remove("/mnt/key");
@@ -156,7 +156,7 @@ TEST_F(ZepMediaTest, MakesTheMountPointAndPrintsJson) {
             "/mnt/key /mnt/key");
 }
 
-TEST_F(ZepMediaTest, AnotherMediumAtTheMountPointIsNeverTakenForTheDevice) {
+TEST_F(ZepMediaTest, AnotherMediumAtTheMountPointIsNeverUsed) {
   MakeImage(fDir.Path("first"), "first");
   MakeImage(fDir.Path("second"), "second");
   EXPECT_EQ(WithZep([&] {
@@ -167,13 +167,13 @@ TEST_F(ZepMediaTest, AnotherMediumAtTheMountPointIsNeverTakenForTheDevice) {
               Do("umount /mnt/key");
               return Replaced(text, first.Path(), "FIRST") + Joined(NamesIn(fDir.Path("first")));
             }),
-            "zep: /mnt/key holds FIRST; unmount that first\nexit status 1\n"
-            "zep: /mnt/key holds FIRST; unmount that first\nexit status 1\nlabel.txt");
+            "zep: FIRST is already mounted at /mnt/key; unmount it first\nexit status 1\n"
+            "zep: FIRST is already mounted at /mnt/key; unmount it first\nexit status 1\nlabel.txt");
 }
 
-// ---- Devices by names of the tests' own ----
+// ---- Devices with chosen names ----
 
-// For use in a child: covers /dev/shm and what sysfs has of block devices with file systems of the child's own.
+// For use in a child: covers /dev/shm and the block devices in sysfs with private file systems of the child.
 class TFakeDisks {
 public:
   TFakeDisks() {
@@ -181,12 +181,12 @@ public:
     fs::create_directories("/sys/dev/block");
   }
 
-  // "/dev/shm/key1" for a loop device.
+  // Adds a node such as "/dev/shm/key1" for a loop device.
   void AddNode(std::string const& name, TLoopDevice const& loop) const {
     if (::mknod(("/dev/shm/" + name).c_str(), S_IFBLK | 0600, NumberOf(loop)) != 0)
-      throw std::runtime_error("cannot make a node");
+      throw std::runtime_error("cannot create a node");
   }
-  // In sysfs at a place such as "key1/key11", which is a partition of key1.
+  // Adds a loop device to sysfs at a place such as "key1/key11", which is a partition of key1.
   void AddPlace(std::string const& place, TLoopDevice const& loop) const {
     fs::path const path = "/sys/dev/disks/" + place;
     fs::create_directories(path);
@@ -208,36 +208,37 @@ private:
   }
 };
 
-TEST_F(ZepMediaTest, AnotherDevicesPartitionIsNeverTakenForTheFirstOne) {
+TEST_F(ZepMediaTest, AnotherDevicesPartitionIsNeverUsedAsTheFirstPartition) {
   WriteFile(fDir.Path("none"), std::string(1 << 20, '\0'));
   MakeImage(fDir.Path("other"), "other");
-  EXPECT_EQ(
-      WithZep([&] {
-        TFakeDisks const disks;
-        TLoopDevice const none(fDir.Path("none")), other(fDir.Path("other"));
-        disks.AddNode("key1", none);
-        disks.AddNode("key11", other);
-        disks.AddPlace("key/key1", none);
-        disks.AddPlace("key/key11", other);
-        std::string text = Zep({"media", "mount", "/dev/shm/key1"});
-        text += Report("/dev/shm/key1");
-        text += fs::is_empty("/mnt/key") ? "unmounted\n" : "mounted\n";
-        Do("mount /dev/shm/key11 /mnt/key");
-        text += Zep({"media", "mount", "/dev/shm/key1"});
-        text += Report("/dev/shm/key1");
-        text += Joined(NamesAt("/mnt/key"));
-        Do("umount /mnt/key");
-        return text;
-      }),
-      "zep: /dev/shm/key1 is not mounted: /dev/shm/key11, which would be tried as well, is not a partition of it\nexit status 1\n"
-      "zep: /dev/shm/key1 is not mounted: /dev/shm/key11, which would be tried as well, is not a partition of it\nexit status 1\n"
-      "unmounted\n"
-      "zep: /mnt/key holds /dev/shm/key11; unmount that first\nexit status 1\n"
-      "zep: /mnt/key holds /dev/shm/key11; unmount that first\nexit status 1\n"
-      "label.txt");
+  EXPECT_EQ(WithZep([&] {
+              TFakeDisks const disks;
+              TLoopDevice const none(fDir.Path("none")), other(fDir.Path("other"));
+              disks.AddNode("key1", none);
+              disks.AddNode("key11", other);
+              disks.AddPlace("key/key1", none);
+              disks.AddPlace("key/key11", other);
+              std::string text = Zep({"media", "mount", "/dev/shm/key1"});
+              text += Report("/dev/shm/key1");
+              text += fs::is_empty("/mnt/key") ? "unmounted\n" : "mounted\n";
+              Do("mount /dev/shm/key11 /mnt/key");
+              text += Zep({"media", "mount", "/dev/shm/key1"});
+              text += Report("/dev/shm/key1");
+              text += Joined(NamesAt("/mnt/key"));
+              Do("umount /mnt/key");
+              return text;
+            }),
+            "zep: /dev/shm/key1 was not mounted: the mount would also try /dev/shm/key11, which is not a partition of "
+            "/dev/shm/key1\nexit status 1\n"
+            "zep: /dev/shm/key1 was not mounted: the mount would also try /dev/shm/key11, which is not a partition of "
+            "/dev/shm/key1\nexit status 1\n"
+            "unmounted\n"
+            "zep: /dev/shm/key11 is already mounted at /mnt/key; unmount it first\nexit status 1\n"
+            "zep: /dev/shm/key11 is already mounted at /mnt/key; unmount it first\nexit status 1\n"
+            "label.txt");
 }
 
-TEST_F(ZepMediaTest, ADevicesOwnFirstPartitionWillDo) {
+TEST_F(ZepMediaTest, ADevicesOwnFirstPartitionIsMounted) {
   WriteFile(fDir.Path("none"), std::string(1 << 20, '\0'));
   MakeImage(fDir.Path("part"), "partition");
   EXPECT_EQ(WithZep([&] {
@@ -254,10 +255,10 @@ TEST_F(ZepMediaTest, ADevicesOwnFirstPartitionWillDo) {
             }),
             "/dev/shm/key1 is mounted at /mnt/key\nexit status 0\n"
             "/dev/shm/key1 is mounted at /mnt/key\nexit status 0\n"
-            "/mnt/key is unmounted; the medium can be taken out\nexit status 0\n");
+            "/mnt/key is unmounted; the medium can be removed\nexit status 0\n");
 }
 
-TEST_F(ZepMediaTest, AMediumThatIsMountedElsewhereTooCannotBeTakenOut) {
+TEST_F(ZepMediaTest, AMediumThatIsAlsoMountedElsewhereCannotBeRemoved) {
   MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
               TLoopDevice const loop(fDir.Path("key"));
@@ -282,23 +283,23 @@ TEST_F(ZepMediaTest, AMediumThatIsMountedElsewhereTooCannotBeTakenOut) {
             "/mnt/key is unmounted; the medium is still mounted at /mnt/a /mnt/b c\nexit status 2\n"
             "... on LOOP, which is still mounted at /mnt/a /mnt/b c.\nexit status 0\n"
             "[\"/mnt/a\"]\n[\"/mnt/a\"]\n"
-            "/mnt/a is unmounted; the medium can be taken out\nexit status 0\n");
+            "/mnt/a is unmounted; the medium can be removed\nexit status 0\n");
 }
 
-TEST_F(ZepMediaTest, AllPartitionsAndVolumesOfADriveAreTakenOutTogether) {
-  for (char const* name : {"first", "second", "volume", "stranger"}) MakeImage(fDir.Path(name), name);
+TEST_F(ZepMediaTest, ADriveCanBeRemovedWhenAllItsPartitionsAndVolumesAreUnmounted) {
+  for (char const* name : {"first", "second", "volume", "unrelated"}) MakeImage(fDir.Path(name), name);
   EXPECT_EQ(WithZep([&] {
               TFakeDisks const disks;
               TLoopDevice const first(fDir.Path("first")), second(fDir.Path("second")), volume(fDir.Path("volume"));
-              TLoopDevice const stranger(fDir.Path("stranger"));
+              TLoopDevice const unrelated(fDir.Path("unrelated"));
               disks.AddPlace("key/key1", first);
               disks.AddPlace("key/key2", second);
-              disks.AddPlace("other/other1", stranger);
+              disks.AddPlace("other/other1", unrelated);
               disks.AddPlace("volume", volume);
               disks.AddSlave("volume", "key/key2");
               for (char const* name : {"a", "b", "c"}) fs::create_directory(std::string("/mnt/") + name);
               Do("mount " + first.Path() + " /mnt/key; mount " + second.Path() + " /mnt/a; mount " + volume.Path() + " /mnt/b");
-              Do("mount " + stranger.Path() + " /mnt/c");
+              Do("mount " + unrelated.Path() + " /mnt/c");
               std::string text;
               for (char const* directory : {"/mnt/key", "/mnt/a", "/mnt/c", "/mnt/b"})
                 text += Zep({"media", "umount", directory});
@@ -306,19 +307,19 @@ TEST_F(ZepMediaTest, AllPartitionsAndVolumesOfADriveAreTakenOutTogether) {
             }),
             "/mnt/key is unmounted; the medium is still mounted at /mnt/a /mnt/b\nexit status 2\n"
             "/mnt/a is unmounted; the medium is still mounted at /mnt/b\nexit status 2\n"
-            "/mnt/c is unmounted; the medium can be taken out\nexit status 0\n"
-            "/mnt/b is unmounted; the medium can be taken out\nexit status 0\n");
+            "/mnt/c is unmounted; the medium can be removed\nexit status 0\n"
+            "/mnt/b is unmounted; the medium can be removed\nexit status 0\n");
 }
 
-// ---- What cannot be done ----
+// ---- Failures ----
 
-TEST_F(ZepMediaTest, WhatHasNoFileSystemCannotBeMounted) {
+TEST_F(ZepMediaTest, AMediumWithoutAFileSystemCannotBeMounted) {
   WriteFile(fDir.Path("key"), std::string(1 << 20, '\0'));
   EXPECT_EQ(WithZep([&] {
               TLoopDevice const loop(fDir.Path("key"));
               return Replaced(Zep({"media", "mount", loop.Path()}), loop.Path(), "LOOP");
             }),
-            "zep: LOOP cannot be mounted: neither it nor LOOP1 has a file system that can be read\nexit status 1\n");
+            "zep: LOOP cannot be mounted: neither it nor LOOP1 has a readable file system\nexit status 1\n");
 }
 
 TEST_F(ZepMediaTest, ABusyMediumCannotBeUnmounted) {
@@ -334,8 +335,8 @@ TEST_F(ZepMediaTest, ABusyMediumCannotBeUnmounted) {
               text += Zep({"media", "umount", "/mnt/key"});
               return text;
             }),
-            "zep: /mnt/key cannot be unmounted: something still uses it\nexit status 1\n"
-            "/mnt/key is unmounted; the medium can be taken out\nexit status 0\n");
+            "zep: /mnt/key cannot be unmounted: it is still in use\nexit status 1\n"
+            "/mnt/key is unmounted; the medium can be removed\nexit status 0\n");
 }
 
 // ---- The report ----
@@ -347,12 +348,12 @@ TEST_F(ZepMediaTest, AReportIsOnTheMediumWhenZepEnds) {
               TRun const run = fInstallation->Run({{"report", "--sample", "--to-media", loop.Path()}});
               EXPECT_EQ(run.status, 0) << run.errors;
               EXPECT_EQ(run.errors, "");
-              std::vector<std::string> names = NamesIn(fDir.Path("key"));  // the image itself, not the device
+              std::vector<std::string> names = NamesIn(fDir.Path("key"));  // read from the image itself, not through the device
               std::sort(names.begin(), names.end());
               EXPECT_EQ(names.size(), 2u) << Joined(names);
               if (names.size() != 2) return "no report";
               EXPECT_THAT(names[1], testing::MatchesRegex("zep-report-sample-server-20[0-9]{6}T[0-9]{6}Z\\.txt"));
-              EXPECT_EQ(run.output, "The report is " + names[1] + " on " + loop.Path() + ", which can be taken out.\n");
+              EXPECT_EQ(run.output, "The report is " + names[1] + " on " + loop.Path() + ", which can be removed.\n");
               EXPECT_THAT(ReadFile("/proc/self/mounts"), Not(HasSubstr("/mnt/key")));
 
               Do("mount " + fDir.Path("key") + " /mnt/key");
@@ -366,7 +367,7 @@ TEST_F(ZepMediaTest, AReportIsOnTheMediumWhenZepEnds) {
             "done");
 }
 
-TEST_F(ZepMediaTest, AJsonReportIsAFileAndAnAnswer) {
+TEST_F(ZepMediaTest, WithJsonBothTheFileAndTheOutputAreJson) {
   MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
               TLoopDevice const loop(fDir.Path("key"));
@@ -385,12 +386,12 @@ TEST_F(ZepMediaTest, AJsonReportIsAFileAndAnAnswer) {
             "done");
 }
 
-// No success is told, no report is left, and the medium is unmounted.
+// Expects the failure, and that success is not reported.
 void ExpectFailure(std::string const& text, std::string const& reason) {
   EXPECT_THAT(text, HasSubstr("zep: zep-report-sample-server-"));
-  EXPECT_THAT(text, HasSubstr(" cannot be written on LOOP: " + reason + "\n"));
+  EXPECT_THAT(text, HasSubstr(" cannot be written to LOOP: " + reason + "\n"));
   EXPECT_THAT(text, HasSubstr("exit status 1\n"));
-  EXPECT_THAT(text, Not(HasSubstr("can be taken out")));
+  EXPECT_THAT(text, Not(HasSubstr("can be removed")));
 }
 
 TEST_F(ZepMediaTest, AFullMediumIsAFailure) {
@@ -420,8 +421,8 @@ TEST_F(ZepMediaTest, AReadOnlyMediumIsAFailure) {
   EXPECT_THAT(text, testing::EndsWith("label.txt unmounted"));
 }
 
-// The image lies where there is no room for what is written: write() succeeds, and only syncing tells that nothing arrives.
-TEST_F(ZepMediaTest, AMediumThatTakesNoDataIsAFailure) {
+// The image is on a full file system: write() succeeds, and only syncing reports that no data can be stored.
+TEST_F(ZepMediaTest, AMediumThatCannotStoreDataIsAFailure) {
   std::string const text = WithZep([&] {
     fs::create_directory("/mnt/store");
     if (!MountTmpfs("/mnt/store", "size=3m")) return std::string("cannot mount");
@@ -432,12 +433,12 @@ TEST_F(ZepMediaTest, AMediumThatTakesNoDataIsAFailure) {
     return Replaced(report, loop.Path(), "LOOP") + (fs::is_empty("/mnt/key") ? "unmounted" : "mounted");
   });
   EXPECT_THAT(text, StartsWith("zep: zep-report-sample-server-"));
-  EXPECT_THAT(text, HasSubstr(" cannot be written on LOOP: "));
+  EXPECT_THAT(text, HasSubstr(" cannot be written to LOOP: "));
   EXPECT_THAT(text, testing::EndsWith("\nexit status 1\nunmounted"));
 }
 
-// The kernel keeps a loop device that is in use until the last user goes, so that the report arrives all the same.
-TEST_F(ZepMediaTest, ALoopDeviceDetachedInTheMiddleStillGetsTheReport) {
+// The kernel detaches a loop device that is in use only after its last user has closed it, so the report is written nevertheless.
+TEST_F(ZepMediaTest, ALoopDeviceDetachedDuringTheWriteStillReceivesTheReport) {
   MakeImage(fDir.Path("key"), "whole");
   std::string const text = WithZep([&] {
     TLoopDevice const loop(fDir.Path("key"));
@@ -450,7 +451,7 @@ TEST_F(ZepMediaTest, ALoopDeviceDetachedInTheMiddleStillGetsTheReport) {
 }
 
 // The signal arrives while the report is being written: before the first fsync the file still has its temporary name.
-TEST_F(ZepMediaTest, InterruptedReportLeavesTheMediumUnmountedWithoutAPart) {
+TEST_F(ZepMediaTest, AfterAnInterruptTheMediumIsUnmountedAndHasNoPartOfTheReport) {
   MakeImage(fDir.Path("key"), "whole");
   for (int const signal : {SIGINT, SIGTERM, SIGHUP}) {
     SCOPED_TRACE(signal);
@@ -466,12 +467,12 @@ TEST_F(ZepMediaTest, InterruptedReportLeavesTheMediumUnmountedWithoutAPart) {
     });
     std::string const status = std::to_string(128 + signal);
     EXPECT_THAT(text,
-                testing::MatchesRegex("zep: zep-report-sample-server-[0-9TZ]*\\.json cannot be written on LOOP: interrupted\n" +
+                testing::MatchesRegex("zep: zep-report-sample-server-[0-9TZ]*\\.json cannot be written to LOOP: interrupted\n" +
                                       status + " " + status + " unmounted label.txt"));
   }
 }
 
-// At the second fsync the file has its name.
+// At the second fsync, the file already has its final name.
 TEST_F(ZepMediaTest, InterruptAfterTheReportIsCompleteStillUnmountsTheMedium) {
   MakeImage(fDir.Path("key"), "whole");
   std::string const text = WithZep([&] {
@@ -485,11 +486,11 @@ TEST_F(ZepMediaTest, InterruptAfterTheReportIsCompleteStillUnmountsTheMedium) {
            (isMounted ? " mounted " : " unmounted ") + Joined(NamesIn(fDir.Path("key")));
   });
   EXPECT_THAT(text,
-              testing::MatchesRegex("zep: (zep-report-sample-server-[0-9TZ]*\\.txt) is written on LOOP, which can be taken out: "
+              testing::MatchesRegex("zep: (zep-report-sample-server-[0-9TZ]*\\.txt) was written to LOOP, which can be removed: "
                                     "interrupted\n130 unmounted label.txt zep-report-.*\\.txt"));
 }
 
-TEST_F(ZepMediaTest, AReportOnABusyMediumIsThereThoughItCannotBeUnmounted) {
+TEST_F(ZepMediaTest, AReportIsWrittenToABusyMediumThatCannotBeUnmounted) {
   MakeImage(fDir.Path("key"), "whole");
   std::string const text = WithZep([&] {
     TLoopDevice const loop(fDir.Path("key"));
@@ -503,12 +504,12 @@ TEST_F(ZepMediaTest, AReportOnABusyMediumIsThereThoughItCannotBeUnmounted) {
     return Replaced(report, loop.Path(), "LOOP") + Joined(NamesIn(fDir.Path("key")));
   });
   EXPECT_THAT(text,
-              testing::MatchesRegex("zep: (zep-report-sample-server-[0-9TZ]*\\.txt) is written on LOOP, but /mnt/key cannot be "
-                                    "unmounted: something still uses it\nexit status 1\nlabel.txt zep-report-.*\\.txt"));
+              testing::MatchesRegex("zep: (zep-report-sample-server-[0-9TZ]*\\.txt) was written to LOOP, but /mnt/key cannot be "
+                                    "unmounted: it is still in use\nexit status 1\nlabel.txt zep-report-.*\\.txt"));
 }
 
-// Some file systems cannot be told to replace nothing.
-TEST_F(ZepMediaTest, NothingIsReplacedOnAnyFileSystem) {
+// Some file systems do not support a rename that replaces nothing.
+TEST_F(ZepMediaTest, AnExistingFileIsNeverReplacedOnAnyFileSystem) {
   MakeImage(fDir.Path("key"), "whole");
   for (int const error : {0, EINVAL, ENOSYS}) {
     SCOPED_TRACE(error);
@@ -531,11 +532,11 @@ TEST_F(ZepMediaTest, NothingIsReplacedOnAnyFileSystem) {
                 UnmountDirectory("/mnt/key");
                 return Replaced(text, loop.Path(), "LOOP") + Joined(NamesIn(fDir.Path("key")));
               }),
-              "report cannot be written on LOOP: File exists\nlink cannot be written on LOOP: File exists\nfirst label.txt");
+              "report cannot be written to LOOP: File exists\nlink cannot be written to LOOP: File exists\nfirst label.txt");
   }
 }
 
-TEST_F(ZepMediaTest, AnyOtherFailureToRenameIsOne) {
+TEST_F(ZepMediaTest, AnyOtherFailureToRenameIsReported) {
   MakeImage(fDir.Path("key"), "whole");
   EXPECT_EQ(WithZep([&] {
               TLoopDevice const loop(fDir.Path("key"));
@@ -550,7 +551,7 @@ TEST_F(ZepMediaTest, AnyOtherFailureToRenameIsOne) {
               UnmountDirectory("/mnt/key");
               return Replaced(text, loop.Path(), "LOOP") + "\n" + Joined(NamesIn(fDir.Path("key")));
             }),
-            "report cannot be written on LOOP: Input/output error\nlabel.txt");
+            "report cannot be written to LOOP: Input/output error\nlabel.txt");
 }
 
 TEST_F(ZepMediaTest, ADetachedLoopDeviceIsAFailure) {
@@ -560,7 +561,7 @@ TEST_F(ZepMediaTest, ADetachedLoopDeviceIsAFailure) {
               Do("/usr/sbin/losetup --detach " + loop.Path());
               return Replaced(Report(loop.Path()), loop.Path(), "LOOP") + Joined(NamesIn(fDir.Path("key")));
             }),
-            "zep: LOOP cannot be mounted: neither it nor LOOP1 has a file system that can be read\nexit status 1\nlabel.txt");
+            "zep: LOOP cannot be mounted: neither it nor LOOP1 has a readable file system\nexit status 1\nlabel.txt");
 }
 
 }  // namespace

@@ -1,20 +1,20 @@
 # SPDX-License-Identifier: Apache-2.0
 
-# Run in the virtual machine: what the operations on removable media come to there. Each file in /out is looked at by one
-# test of MediaVmTest.cpp.
+# Runs in the virtual machine: performs the operations on removable media and stores their results. Each file in /out is checked
+# by one test of MediaVmTest.cpp.
 #
 #   in-vm.sh PROBE ZEP PULLSOUT
 probe=$1 zep=$2 pulls_out=$3
 usb_disk=/sys/kernel/config/usb_gadget/g0/UDC  # the controller's virtual disk; unplugged by writing an empty line
 
-wait_for() {  # wait_for [!] FILE: until it is there, or gone; up to 10 s
+wait_for() {  # wait_for [!] FILE: until FILE exists or, with !, is gone; up to 10 s
   tries=0
   while [ $tries -lt 100 ]; do
     if [ "$1" = ! ]; then [ -e "$2" ] || return 0; else [ ! -e "$1" ] || return 0; fi
     tries=$((tries + 1))
     sleep 0.1
   done
-  echo "in-vm.sh: waited in vain for $*" >&2
+  echo "in-vm.sh: timed out after 10 s waiting for $*" >&2
 }
 udc=$(cat $usb_disk)
 unplug="echo > $usb_disk; while [ -e /dev/sdc ]; do sleep 0.1; done"
@@ -99,7 +99,8 @@ key_mounts >> /out/zep-mount
   blockdev --setrw /dev/sdc
 } > /out/read-only 2>&1
 
-# Pulled out before the first sync, which is that of the file, and before the second, that of the directory.
+# The medium is pulled out before the first sync, which is that of the file, and before the second, which is that of the
+# directory.
 for sync in 1 2; do
   {
     ZEP_PULL="$unplug" ZEP_PULL_AT=$sync LD_PRELOAD="$pulls_out" "$zep" report --sample --to-media /dev/sdc

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// What every JSON document of zep has.
+// The members that every JSON document of zep has.
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -10,7 +10,7 @@
 
 namespace NQRVZEP20::zep {
 
-// Expects one document of that name, which says what zep ended with and, unless that is 0, why.
+// Expects a document of that name that contains the exit status and, unless the status is 0, a reason.
 inline void ExpectEnvelope(nlohmann::json const& document, int status, std::string const& name) {
   SCOPED_TRACE(document.dump());
   ASSERT_TRUE(document.is_object());

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// zep as users have it: the real program, run as a child in a copy of what an installation lays side by side.
+// Runs zep as users do: the real program, as a child process, in a copy of the files of an installation.
 
 #include "tests/SmbiosTables.h"
 
@@ -28,16 +28,16 @@ struct TRun {
 struct TCall {
   std::vector<std::string> arguments;
   std::map<std::string, std::string> environment = {};
-  bool asNobody = false;            // as a user without privileges
-  bool ignoresBrokenPipes = false;  // with SIGPIPE ignored, as some callers leave it
-  bool ignoresChildren = false;     // the same with SIGCHLD
-  std::string outputFile = {};      // instead of one that is read back
-  int outputDescriptor = -1;        // the same, as an open descriptor
-  std::string directory = {};       // to work in
-  bool hasNoTerminal = false;       // in a session of its own
+  bool asNobody = false;            // run as a user without privileges
+  bool ignoresBrokenPipes = false;  // run with SIGPIPE ignored, as some callers do
+  bool ignoresChildren = false;     // run with SIGCHLD ignored, as some callers do
+  std::string outputFile = {};      // receives standard output, which is then not read back
+  int outputDescriptor = -1;        // the same as an open descriptor; -1: none
+  std::string directory = {};       // the working directory; empty: the caller's
+  bool hasNoTerminal = false;       // run in a session of its own
 };
 
-// How long something took differs: "after 0.1 s" becomes "after N s".
+// Replaces durations, which differ from run to run: "after 0.1 s" becomes "after N s".
 inline std::string WithoutSeconds(std::string const& text) {
   return std::regex_replace(text, std::regex("after [0-9]+\\.[0-9] s"), "after N s");
 }
@@ -61,7 +61,7 @@ public:
   }
   void Remove(std::string const& library) { fs::remove(fDir.Path("lib/" + library)); }
 
-  // A table file for ZEP_SMBIOS_TABLE.
+  // Writes a table file and returns its path, for ZEP_SMBIOS_TABLE.
   std::string Table(std::string const& table) {
     WriteFile(Path("table"), table);
     return Path("table");
@@ -86,7 +86,7 @@ private:
     std::signal(SIGPIPE, call.ignoresBrokenPipes ? SIG_IGN : SIG_DFL);
     std::signal(SIGCHLD, call.ignoresChildren ? SIG_IGN : SIG_DFL);
     for (char const* name : {"ZEP_SMBIOS_TABLE", "ZEP_HOST_NAME", "ZEP_BMC_PASSWORD", "LD_LIBRARY_PATH"}) ::unsetenv(name);
-    ::setenv("ZEP_SCSI_DEVICES", Path("no-scsi-devices").c_str(), 1);  // whatever this machine has
+    ::setenv("ZEP_SCSI_DEVICES", Path("no-scsi-devices").c_str(), 1);  // hides the devices of this machine
     for (auto const& [name, value] : call.environment) ::setenv(name.c_str(), value.c_str(), 1);
     if (call.asNobody && !BecomeNobody()) ::_exit(126);
 

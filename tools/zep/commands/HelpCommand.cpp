@@ -28,7 +28,7 @@ std::string HelpOf(CLI::App const& zep, std::vector<std::string> const& words) {
   for (std::string const& word : words) {
     before += (before.empty() ? "" : " ") + command->get_name();
     command = CommandNamed(*command, word);
-    if (command == nullptr) throw TWrongUsage("there is no such command; zep --help lists them");
+    if (command == nullptr) throw TWrongUsage("there is no such command; zep --help lists all commands");
   }
   auto const formatter = std::dynamic_pointer_cast<CLI::Formatter>(command->get_formatter());
   return formatter->make_help(command, before.empty() ? command->get_name() : before + " " + command->get_name(),

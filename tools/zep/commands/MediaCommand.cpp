@@ -37,7 +37,7 @@ std::string MountedAt(TMedium const& medium) {
 
 std::string AsText(std::vector<TMedium> const& media) {
   TTable table({12, 9, 11, 11, 12, 15});
-  table.Add({"Device", "Size", "Label", "File system", "Mounted at", "What it is"});
+  table.Add({"Device", "Size", "Label", "File system", "Mounted at", "Description"});
   for (TMedium const& medium : media)
     table.Add({medium.fDevice, medium.fSize == 0 ? "-" : SizeText(medium.fSize), OrDash(medium.fLabel),
                OrDash(medium.fFileSystem), MountedAt(medium), OrDash(medium.fDescription)});
@@ -62,8 +62,8 @@ std::string AsJson(std::vector<TMedium> const& media, EExitStatus status, std::s
 
 // Why the list is empty or incomplete; empty when it is complete.
 std::string WhyIncomplete(std::vector<TMedium> const& media) {
-  if (media.empty()) return "there is no removable medium";
-  return AreLabelsReadable() ? "" : "labels and file systems can be read by root only";
+  if (media.empty()) return "no removable medium was found";
+  return AreLabelsReadable() ? "" : "only root can read labels and file systems";
 }
 
 int List(bool asJson) {
@@ -88,12 +88,11 @@ int Unmount(std::string const& argument, bool asJson) {
   std::string const directory = WithoutTrailingSlashes(argument);
   std::vector<std::string> const stillMountedAt = UnmountDirectory(directory);
   EExitStatus const status = stillMountedAt.empty() ? kExitComplete : kExitPartial;
-  std::string const why = stillMountedAt.empty() ? "" : "the medium " + WhetherToTakeOut(stillMountedAt);
+  std::string const why = stillMountedAt.empty() ? "" : "the medium " + RemovalText(stillMountedAt);
   TJson document = DocumentHead("zep media umount", status, why);
   document["mountPoint"] = directory;
   document["stillMountedAt"] = stillMountedAt;
-  WriteMessage(asJson ? zep::AsText(document)
-                      : directory + " is unmounted; the medium " + WhetherToTakeOut(stillMountedAt) + "\n");
+  WriteMessage(asJson ? zep::AsText(document) : directory + " is unmounted; the medium " + RemovalText(stillMountedAt) + "\n");
   return status;
 }
 
@@ -108,17 +107,20 @@ int Media(TArguments const& arguments) {
 TRun AddMediaArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   CLI::App* const list = command.add_subcommand(kListMedia, "List removable media; the default");
-  CLI::App* const mount = command.add_subcommand("mount", "Mount a medium at /mnt/key, a floppy at /mnt/floppy");
-  CLI::App* const unmount = command.add_subcommand("umount", "Unmount a medium, so that it can be taken out");
-  mount->add_option("device", arguments->fDevice, "The device, such as /dev/sdb; its first partition is tried, too")->required();
-  unmount->add_option("directory", arguments->fDirectory, "Where it is mounted")->required();
+  CLI::App* const mount = command.add_subcommand("mount", "Mount a medium at /mnt/key, or a floppy at /mnt/floppy");
+  CLI::App* const unmount = command.add_subcommand("umount", "Unmount a medium so that it can be removed");
+  mount
+      ->add_option("device", arguments->fDevice,
+                   "The device, such as /dev/sdb; if it cannot be mounted, its first partition is tried")
+      ->required();
+  unmount->add_option("directory", arguments->fDirectory, "The mount point of the medium")->required();
   for (CLI::App* const each : {&command, list, mount, unmount})
     each->add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.require_subcommand(0, 1);
   command.footer(
       "The list contains USB disks, floppies and CD-ROMs with a medium, as lsblk shows them. Mounting needs root.\n"
-      "Device names are below /dev, directories below /mnt, /media or /run/media; both consist of letters, digits, \"/\",\n"
-      "\"-\", \"_\" and \".\".\n"
+      "The device must be a path below /dev; the directory must be below /mnt, /media or /run/media. Both may contain only\n"
+      "letters, digits, \"/\", \"-\", \"_\" and \".\".\n"
       "Exit status: 0 when everything was done, 2 when labels are missing from the list or when the unmounted medium is\n"
       "still mounted elsewhere, 1 when there is no medium or the command failed, 64 for wrong usage.");
   return [arguments] { return Media(*arguments); };

@@ -37,8 +37,8 @@ struct TArguments {
   std::string fMedium;  // the device to write to; empty for standard output
 };
 
-// Returns where the medium is still mounted. A medium that could not be written, or whose writing was interrupted, is unmounted,
-// too; the exception is then that of the writing.
+// Returns the mount points at which the medium is still mounted. When writing fails or is interrupted, the medium is unmounted as
+// well, and the exception of the writing is passed on.
 std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::string const& name, std::string const& text) {
   try {
     medium.Write(name, text);
@@ -53,7 +53,7 @@ std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::stri
   try {
     return UnmountDirectory(medium.MountPoint());
   } catch (std::runtime_error const& failure) {
-    throw std::runtime_error(name + " is written on " + medium.Device() + ", but " + failure.what());
+    throw std::runtime_error(name + " was written to " + medium.Device() + ", but " + failure.what());
   }
 }
 
@@ -63,7 +63,7 @@ TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
   std::string const text = arguments.fAsJson ? AsVerbatimText(ReportAsJson(report)) : ReportAsText(report);
   TMountedMedium const medium(arguments.fMedium);
   std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);
-  ThrowIfInterrupted(name + " is written on " + medium.Device() + ", which " + WhetherToTakeOut(stillMountedAt));
+  ThrowIfInterrupted(name + " was written to " + medium.Device() + ", which " + RemovalText(stillMountedAt));
 
   TJson document = DocumentHead(kToMedia, ExitStatusOf(report.fCompleteness), WhyNotComplete(report), SampleLabelOf(report));
   document["device"] = medium.Device();
@@ -71,7 +71,7 @@ TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
   document["bytes"] = text.size();
   document["stillMountedAt"] = stillMountedAt;
   if (!arguments.fAsJson)
-    WriteMessage("The report is " + name + " on " + medium.Device() + ", which " + WhetherToTakeOut(stillMountedAt) + ".\n");
+    WriteMessage("The report is " + name + " on " + medium.Device() + ", which " + RemovalText(stillMountedAt) + ".\n");
   return document;
 }
 

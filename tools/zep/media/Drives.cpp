@@ -28,7 +28,7 @@ bool IsPartition(fs::path const& place) {
   return !place.empty() && fs::exists(place / "partition", error);
 }
 
-// The slaves of a volume are the devices that it consists of.
+// The directory "slaves" of a volume lists the devices of which the volume consists.
 void AddDrivesOf(fs::path const& place, TDrives& drives) {
   if (place.empty()) return;
   std::error_code error;
@@ -63,7 +63,8 @@ bool IsPartitionOf(std::string const& partition, std::string const& device) {
 TDrives DrivesOf(TMount const& mount) {
   TDrives drives;
   AddDrivesOf(mount.fDevice, drives);
-  // Some file systems have mount numbers of their own. A source that is not a device may be unreachable and is not accessed.
+  // Some file systems have device numbers of their own, so the source is added as well. A source that is not a device may be on
+  // an unreachable server, so it is not accessed.
   if (mount.fSource.rfind("/dev/", 0) == 0) AddDrivesOf(NumberOf(mount.fSource), drives);
   return drives;
 }
@@ -72,9 +73,10 @@ std::vector<std::string> MountPointsOf(TDrives const& drives) {
   std::vector<std::string> mountPoints;
   for (TMount const& mount : Mounts()) {
     TDrives const own = DrivesOf(mount);
-    bool const isThere = std::any_of(own.begin(), own.end(), [&](std::string const& drive) { return drives.count(drive) != 0; });
+    bool const isOnDrive =
+        std::any_of(own.begin(), own.end(), [&](std::string const& drive) { return drives.count(drive) != 0; });
     bool const isNew = std::find(mountPoints.begin(), mountPoints.end(), mount.fMountPoint) == mountPoints.end();
-    if (isThere && isNew) mountPoints.push_back(mount.fMountPoint);
+    if (isOnDrive && isNew) mountPoints.push_back(mount.fMountPoint);
   }
   return mountPoints;
 }

@@ -52,7 +52,7 @@ std::string DescriptionOf(TJson const& drive) {
 
 bool IsPartition(TJson const& node) { return TextOf(node, "type") == "part"; }
 
-// Includes those of an opened encrypted or logical volume, which is a child of its partition.
+// Includes the mount points of an opened encrypted or logical volume, which is a child of its partition.
 void AddMountPoints(TJson const& node, std::vector<std::string>& mountPoints) {
   for (TJson const& mountPoint : node.value("mountpoints", TJson::array()))
     if (mountPoint.is_string()) mountPoints.push_back(mountPoint);
@@ -73,7 +73,7 @@ TMedium MediumFrom(TJson const& node, std::string const& description) {
   return medium;
 }
 
-// The drive itself, when it has no partitions or a file system of its own, and every partition.
+// Adds every partition, and the drive itself when it has no partitions or has a file system of its own.
 void AddMediaOf(TJson const& drive, std::vector<TMedium>& media) {
   TJson const children = drive.value("children", TJson::array());
   TMedium const whole = MediumFrom(drive, DescriptionOf(drive));
@@ -82,7 +82,7 @@ void AddMediaOf(TJson const& drive, std::vector<TMedium>& media) {
     if (IsPartition(child)) media.push_back(MediumFrom(child, whole.fDescription));
 }
 
-// Whether an optical drive is empty. The query does not move its tray.
+// Whether the medium is an optical drive that is empty. The query does not move the tray.
 bool IsEmptyDrive(TMedium const& medium) {
   if (!medium.fIsOptical) return false;
   TUniqueFd const drive(::open(medium.fDevice.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
@@ -95,7 +95,7 @@ bool HasUdev() { return TOSSpecific::DirExists("/run/udev/data"); }
 
 // ---- mountinfo ----
 
-// Blanks and the like are written as "\040".
+// The kernel writes a blank as "\040", and some other characters in the same way.
 std::string WithoutEscapes(std::string const& text) {
   std::string plain;
   for (std::size_t at = 0; at < text.size(); ++at) {
@@ -123,18 +123,18 @@ std::string WithoutTrailingSlashes(std::string name) {
 }
 
 void CheckDevice(std::string const& device) {
-  if (device.find('@') != device.npos) throw TWrongUsage("that is not a name of a device");  // it may contain a password
+  if (device.find('@') != device.npos) throw TWrongUsage("the argument is not a device name");  // it may contain a password
   if (device.rfind("/dev/", 0) != 0 || !IsPlainPath(device))
     throw TWrongUsage("\"" + device +
-                      "\" is not a name of a device: below /dev, of letters, digits, \"/\", \"-\", \"_\" and \".\"");
-  if (!TOSSpecific::FileExists(device)) throw std::runtime_error("there is no device " + device);
+                      "\" is not a device name: it must be a path below /dev of letters, digits, \"/\", \"-\", \"_\" and \".\"");
+  if (!TOSSpecific::FileExists(device)) throw std::runtime_error("the device " + device + " does not exist");
 }
 
 std::vector<TMedium> MediaIn(std::string const& lsblkOutput) {
-  std::size_t const start = lsblkOutput.find('{');  // after warnings
+  std::size_t const start = lsblkOutput.find('{');  // warnings may precede the document
   TJson const document = TJson::parse(start == lsblkOutput.npos ? "" : lsblkOutput.substr(start), nullptr, false);
   if (!document.is_object() || !document.contains("blockdevices") || !document["blockdevices"].is_array())
-    throw std::runtime_error("lsblk printed something else than its list: " + lsblkOutput);
+    throw std::runtime_error("lsblk did not print its list as JSON, but: " + lsblkOutput);
   std::vector<TMedium> media;
   for (TJson const& drive : document["blockdevices"])
     if (drive.is_object() && IsRemovable(drive)) AddMediaOf(drive, media);
@@ -154,7 +154,7 @@ std::vector<TMedium> FindMedia() {
   std::vector<std::string> const arguments = {"--json", "--bytes", "--paths", "--output",
                                               "NAME,TYPE,SIZE,LABEL,FSTYPE,RM,RO,TRAN,MOUNTPOINTS,VENDOR,MODEL"};
   if (TOSSpecific::SpawnProcess("lsblk", arguments, output, kTimeoutSeconds) != 0)
-    throw std::runtime_error(output.empty() ? "lsblk cannot be run, or fails and says nothing; the package util-linux has it"
+    throw std::runtime_error(output.empty() ? "lsblk is missing, or failed without a message; it is in the package util-linux"
                                             : "lsblk failed: " + output.substr(0, output.find('\n')));
   std::vector<TMedium> media = MediaIn(output);
   media.erase(std::remove_if(media.begin(), media.end(), IsEmptyDrive), media.end());

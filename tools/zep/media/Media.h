@@ -10,12 +10,11 @@ namespace NQRVZEP20::zep {
 
 // ---- Names ----
 
-// Whether a name can be passed to the library, which inserts it into a shell command verbatim: an absolute path of letters,
-// digits,
-// "/", "-", "_" and ".", without the parts "." and "..".
+// Whether a name is safe to pass to the library, which inserts it into a shell command verbatim. Such a name is an absolute path
+// that consists of letters, digits, "/", "-", "_" and ".", and has no component "." or "..".
 bool IsPlainPath(std::string const& name);
 
-// "/mnt/key" for "/mnt/key/"; "/" stays.
+// "/mnt/key" for "/mnt/key/"; "/" is returned unchanged.
 std::string WithoutTrailingSlashes(std::string name);
 
 // Throws TWrongUsage for a name that is not a plain path below /dev, std::runtime_error for a device that does not exist.
@@ -26,25 +25,26 @@ void CheckDevice(std::string const& device);
 // A removable medium, or a partition of one, that can hold a file system.
 struct TMedium {
   std::string fDevice;       // "/dev/sdb1"
-  std::string fDescription;  // maker and product; may be empty, as the next two
+  std::string fDescription;  // maker and product; may be empty, like the label and the file system
   std::string fLabel, fFileSystem;
   std::uint64_t fSize;  // in bytes
   bool fIsReadOnly;
-  std::vector<std::string> fMountPoints;  // of its encrypted and logical volumes, too; none when it is not mounted
+  std::vector<std::string> fMountPoints;  // includes those of its encrypted and logical volumes; empty when it is not mounted
   bool fIsOptical;
 };
 
-// The media in the output of "lsblk --json", of disks and drives that are removable or connected by USB. Throws
-// std::runtime_error for any other output.
+// Returns the media of the disks and drives that are removable or connected by USB, from the output of "lsblk --json". Throws
+// std::runtime_error when the output has another format.
 std::vector<TMedium> MediaIn(std::string const& lsblkOutput);
 
-// Label and file system in the output of "blkid -o export".
+// Copies the label and the file system from the output of "blkid -o export" to the medium.
 void ReadLabel(std::string const& blkidOutput, TMedium& medium);
 
 // The media of this machine.
 std::vector<TMedium> FindMedia();
 
-// Whether this user can see labels and file systems: root reads them, and udev publishes them for everyone.
+// Whether this user can see labels and file systems. Root can read them from the devices; where udev runs, it publishes them to
+// every user.
 bool AreLabelsReadable();
 
 struct TMount {
@@ -58,7 +58,7 @@ struct TMount {
 std::vector<TMount> MountsIn(std::string const& mountInfo);
 std::vector<TMount> Mounts();
 
-// The mount at exactly that directory; the topmost when there are several.
+// The mount whose mount point is exactly `directory`; the topmost when there are several.
 std::optional<TMount> MountIn(std::string const& mountInfo, std::string const& directory);
 std::optional<TMount> MountAt(std::string const& directory);
 

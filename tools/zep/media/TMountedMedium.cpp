@@ -40,30 +40,30 @@ void ThrowIf(bool hasFailed, std::string const& what) {
 // The device that the library tries to mount when the device itself cannot be mounted.
 std::string FirstPartitionOf(std::string const& device) { return device + "1"; }
 
-// Some file systems have mount numbers of their own.
+// Some file systems have device numbers of their own, so the source is compared as well.
 bool IsMountOf(std::string const& node, TMount const& mount) {
   std::uint64_t const number = NumberOf(node);
   return number != 0 && (number == mount.fDevice || number == NumberOf(mount.fSource));
 }
 
-// Whether the mount is that of the device, or of its first partition.
+// Whether the mount is a mount of the device or of its first partition.
 bool IsOf(TMount const& mount, std::string const& device) {
   std::string const partition = FirstPartitionOf(device);
   return IsMountOf(device, mount) || (IsMountOf(partition, mount) && IsPartitionOf(partition, device));
 }
 
 void RefuseOther(std::optional<TMount> const& mount, std::string const& mountPoint, std::string const& device) {
-  if (mount && !IsOf(*mount, device)) Throw(mountPoint + " holds " + mount->fSource + "; unmount that first");
+  if (mount && !IsOf(*mount, device)) Throw(mount->fSource + " is already mounted at " + mountPoint + "; unmount it first");
 }
 
-// "/dev/sdb11" is not the first partition of "/dev/sdb1".
-void RefuseStranger(std::string const& device) {
+// The library would also try the device whose name ends in one more "1", but "/dev/sdb11" is not a partition of "/dev/sdb1".
+void RefuseForeignPartition(std::string const& device) {
   std::string const next = FirstPartitionOf(device);
   if (NumberOf(next) != 0 && !IsPartitionOf(next, device))
-    Throw(device + " is not mounted: " + next + ", which would be tried as well, is not a partition of it");
+    Throw(device + " was not mounted: the mount would also try " + next + ", which is not a partition of " + device);
 }
 
-// The library runs the program by the shell; a missing program looks like a medium that cannot be read.
+// The library runs the program through the shell, where a missing program cannot be distinguished from an unreadable medium.
 void NeedProgram(std::string const& name) {
   char const* const path = std::getenv("PATH");
   std::istringstream directories(path != nullptr ? path : "");
@@ -75,38 +75,38 @@ void NeedProgram(std::string const& name) {
 TMount MountOrThrow(std::string const& device, std::string const& mountPoint) {
   std::optional<TMount> const present = MountAt(mountPoint);
   RefuseOther(present, mountPoint, device);
-  if (!present) RefuseStranger(device);
+  if (!present) RefuseForeignPartition(device);
   if (!TOSSpecific::IsAdmin()) Throw("only root can mount " + device);
   NeedProgram("mount");
   try {
     if (!TOSSpecific::DirExists(mountPoint)) TOSSpecific::CreateDir(mountPoint);
   } catch (TZEPException const& failure) {
-    Throw("the directory " + mountPoint + " cannot be made: " + failure.what());
+    Throw("the directory " + mountPoint + " cannot be created: " + failure.what());
   }
   try {
     TInterruptsBlocked const blocked;
     TOSSpecific::MountDevice(device);
   } catch (TZEPException const&) {
-    Throw(device + " cannot be mounted: neither it nor " + FirstPartitionOf(device) + " has a file system that can be read");
+    Throw(device + " cannot be mounted: neither it nor " + FirstPartitionOf(device) + " has a readable file system");
   }
   std::optional<TMount> const mount = MountAt(mountPoint);
-  if (!mount) Throw(device + " was not mounted: a mount point whose name ends in " + mountPoint + " is in the way");
+  if (!mount) Throw(device + " was not mounted: another mount point ends in " + mountPoint + "; unmount it first");
   RefuseOther(mount, mountPoint, device);
   return *mount;
 }
 
-// The directories where media are mounted: a mistyped name must not unmount another file system.
+// Accepts only directories where media are mounted, so that a mistyped name does not unmount another file system.
 void CheckDirectory(std::string const& directory) {
   auto const isBelow = [&](char const* place) { return directory.rfind(place, 0) == 0; };
   if (IsPlainPath(directory) && (isBelow("/mnt/") || isBelow("/media/") || isBelow("/run/media/"))) return;
   throw TWrongUsage("\"" + directory +
-                    "\" is not a mount point of a medium: below /mnt, /media or /run/media, of letters, digits, " +
-                    "\"/\", \"-\", \"_\" and \".\"");
+                    "\" is not a mount point of a medium: it must be a path below /mnt, /media or /run/media of letters, " +
+                    "digits, \"/\", \"-\", \"_\" and \".\"");
 }
 
 // ---- Writing ----
 
-// To a name that does not exist yet. Some file systems in user space cannot ensure this themselves.
+// Renames a file unless a file of the new name exists. Some file systems in user space cannot check this themselves.
 void RenameToNew(int directory, std::string const& from, std::string const& to, std::string const& what) {
   if (::renameat2(directory, from.c_str(), directory, to.c_str(), RENAME_NOREPLACE) == 0) return;
   ThrowIf(errno != EINVAL && errno != ENOSYS, what);
@@ -114,7 +114,7 @@ void RenameToNew(int directory, std::string const& from, std::string const& to, 
   ThrowIf(errno != ENOENT || ::renameat(directory, from.c_str(), directory, to.c_str()) != 0, what);
 }
 
-// Some file systems cannot sync a directory; the complete file system is synced then.
+// Some file systems cannot sync a directory, so the complete file system is synced as well.
 void SyncDirectory(int directory, std::string const& what) {
   ThrowIf(::fsync(directory) != 0 && errno != EINVAL, what);
   ThrowIf(::syncfs(directory) != 0, what);
@@ -129,13 +129,14 @@ TMountedMedium::TMountedMedium(std::string const& device) {
 }
 
 void TMountedMedium::Write(std::string const& name, std::string const& contents) const {
-  std::string const what = name + " cannot be written on " + Device();
+  std::string const what = name + " cannot be written to " + Device();
   ThrowIfInterrupted(what);
   if (fMount.fIsReadOnly) Throw(what + ": the medium is read-only");
   TUniqueFd const directory = Open(AT_FDCWD, fMountPoint, O_RDONLY | O_DIRECTORY);
   ThrowIf(!directory, what);
 
-  // Under another name at first, so that a medium that is pulled out never has an incomplete file under the final name.
+  // The file has another name until it is complete, so that a medium that is pulled out never has an incomplete file under the
+  // final name.
   std::string const draft = name + ".part";
   std::string present = draft;
   TUniqueFd const file = Open(directory.get(), draft, O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW);
@@ -161,20 +162,20 @@ std::vector<std::string> UnmountDirectory(std::string const& directory) {
   NeedProgram("umount");
 
   TDrives const drives = DrivesOf(*mount);
-  // Opened before unmounting: its fsync then reports data that could not be written.
+  // The device is opened before the unmount, so that its fsync reports data that could not be written.
   TUniqueFd const source = Open(AT_FDCWD, mount->fSource, O_RDONLY | O_NONBLOCK);
   try {
     TInterruptsBlocked const blocked;
     TOSSpecific::UnmountDevice(mount->fSource, directory);
   } catch (TZEPException const&) {
-    Throw(directory + " cannot be unmounted: something still uses it");
+    Throw(directory + " cannot be unmounted: it is still in use");
   }
-  if (source) ThrowIf(::fsync(source.get()) != 0, mount->fSource + " is unmounted, but was not written to its end");
+  if (source) ThrowIf(::fsync(source.get()) != 0, mount->fSource + " is unmounted, but not all data could be written to it");
   return MountPointsOf(drives);
 }
 
-std::string WhetherToTakeOut(std::vector<std::string> const& stillMountedAt) {
-  if (stillMountedAt.empty()) return "can be taken out";
+std::string RemovalText(std::vector<std::string> const& stillMountedAt) {
+  if (stillMountedAt.empty()) return "can be removed";
   std::string text = "is still mounted at";
   for (std::string const& mountPoint : stillMountedAt) text += " " + Printable(mountPoint);
   return text;

@@ -11,15 +11,15 @@ namespace NQRVZEP20::zep {
 // name.
 class TMountedMedium {
 public:
-  // Mounts the device at the library's mount point for it, which is created when it is missing. A device that is already mounted
-  // there is accepted; another one there is an error.
+  // Mounts the device at the library's mount point for it, which is created when it is missing. It is not an error when the
+  // device is already mounted there, but it is an error when another device is.
   explicit TMountedMedium(std::string const& device);
 
-  std::string const& Device() const { return fMount.fSource; }  // what is mounted: the device or its first partition
+  std::string const& Device() const { return fMount.fSource; }  // the mounted device: the one given, or its first partition
   std::string const& MountPoint() const { return fMountPoint; }
 
-  // Writes a file into the root directory. When it returns, the complete file is on the medium. When it throws, also for a
-  // pending interrupt (Interrupts.h), there is no file of that name, unless there was one before.
+  // Writes a new file into the root directory. On return, the complete file is on the medium. Also throws when a file of that
+  // name exists or an interrupt is pending (Interrupts.h). After an exception, the medium has no new file.
   void Write(std::string const& name, std::string const& contents) const;
 
 private:
@@ -27,11 +27,12 @@ private:
   TMount fMount;
 };
 
-// Unmounts the medium at a directory below /mnt, /media or /run/media (TWrongUsage for any other). When it returns, all data are
-// on the medium. Returns where the medium, or another partition of it, is still mounted: none when it can be taken out.
+// Unmounts the medium at a directory below /mnt, /media or /run/media; throws TWrongUsage for any other directory. On return, all
+// data are on the medium. Returns the mount points at which the medium or another partition of its drive is still mounted; empty
+// when the medium can be removed.
 std::vector<std::string> UnmountDirectory(std::string const& directory);
 
-// "can be taken out", or "is still mounted at /media/a".
-std::string WhetherToTakeOut(std::vector<std::string> const& stillMountedAt);
+// "can be removed", or "is still mounted at /media/a".
+std::string RemovalText(std::vector<std::string> const& stillMountedAt);
 
 }  // namespace NQRVZEP20::zep

@@ -67,7 +67,7 @@ TEST_F(ArgumentsTest, UnknownCommandIsNamed) {
   EXPECT_EQ(Run({"bogus"}).errors, "zep: there is no command \"bogus\"\n");
   EXPECT_EQ(Run({"bogus", "--json"}).errors, "zep: there is no command \"bogus\"\n");
   EXPECT_EQ(Run({"media", "eject"}).errors, "zep: there is no command \"eject\"\n");
-  EXPECT_EQ(Run({}).errors, "zep: no command is named; zep --help lists them\n");
+  EXPECT_EQ(Run({}).errors, "zep: a command is required; zep --help lists all commands\n");
 }
 
 TEST_F(ArgumentsTest, ArgumentsAreEscapedInMessages) {

@@ -75,7 +75,7 @@ protected:
     return commands;
   }
 
-  // The one of those commands that the words name.
+  // The command, among `commands`, that the words name.
   static std::string CommandOf(std::set<std::string> const& commands, std::vector<std::string> const& arguments) {
     std::string command = "zep";
     for (std::string const& argument : arguments)
@@ -87,7 +87,7 @@ protected:
   template <class TRows>
   std::set<std::string> Missing(TRows const& rows, std::set<std::string> const& others) {
     std::set<std::string> const commands = Commands();
-    EXPECT_GT(commands.size(), 10u) << "zep --help is read wrongly";
+    EXPECT_GT(commands.size(), 10u) << "the list of zep --help should be parsed completely";
     std::set<std::string> missing = commands;
     for (std::string const& other : others) missing.erase(other);
     for (TRow const& row : rows) missing.erase(CommandOf(commands, row.arguments));
@@ -137,8 +137,8 @@ TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
   EXPECT_THAT(Missing(rows, {"zep wpad"}), testing::IsEmpty()) << "zep wpad has a test of its own, below";
 }
 
-// Not as root, whose zep would query the network.
-TEST_F(EnvelopeTest, WpadThatMayNotListenPrintsADocument) {
+// Runs zep without privileges, because as root it would query the network.
+TEST_F(EnvelopeTest, WpadWithoutPermissionToListenPrintsADocument) {
   TCall call = {{"wpad", "--json", "--no-stop"}};
   call.asNobody = true;
   TRun const run = fZep.Run(call);
@@ -146,7 +146,7 @@ TEST_F(EnvelopeTest, WpadThatMayNotListenPrintsADocument) {
   ExpectEnvelope(run.output, 1, "zep wpad");
 }
 
-// The commands that are missing here need a server or a device: tests/system shows their documents.
+// The commands that are missing here need a server or a device; tests/system checks their documents.
 TEST_F(EnvelopeTest, EveryCommandThatSucceedsPrintsADocumentWithItsExitStatus) {
   TRow const rows[] = {
       {"zep report", 0, {"report", "--json", "--sample"}},
@@ -204,7 +204,7 @@ TEST_F(EnvelopeTest, EachHostOfAListHasItsOwnDocumentOnOneLine) {
   ASSERT_EQ(LinesOf(failed.output).size(), 1u);
 }
 
-TEST_F(EnvelopeTest, AReportThatIsNotSentNamesTheFileThatKeepsIt) {
+TEST_F(EnvelopeTest, WhenAReportCannotBeSentTheFileThatKeepsItIsNamed) {
   TCall call = {{"report", "--json", "--sample", "--send", "ftp://127.0.0.1:1/d/"}};
   call.environment = {{"TMPDIR", fZep.Path("work")}, {"NETRC", "/dev/null"}};
   TRun const run = fZep.Run(call);

@@ -98,7 +98,7 @@ TEST_F(MofTest, AMistakeIsReportedWithItsPlace) {
   EXPECT_EQ(Run({"mof", "none.mof"}).status, 1);
 }
 
-TEST_F(MofTest, WrongUsageDiffersFromWrongSchemas) {
+TEST_F(MofTest, WrongUsageAndWrongSchemasHaveDifferentStatuses) {
   EXPECT_EQ(Run({"mof"}).status, 64);
   EXPECT_EQ(Run({"mof", "disks.mof", "--print", "--json"}).status, 64);
   EXPECT_EQ(Run({"classes", "--mof"}).status, 64);
@@ -160,7 +160,7 @@ TEST_F(MofTest, ClassesOfProvidersAreListed) {
   EXPECT_THAT(Run({"classes", "--sample"}).output, testing::StartsWith("SAMPLE root/zep/host (Host): "));
 }
 
-TEST_F(MofTest, APlugInThatFailsMakesTheListPartial) {
+TEST_F(MofTest, WithAFailedPlugInTheListIsPartial) {
   fZep.Add("libBroken.nsp.so", File());
   TRun const run = Run({"classes"});
   EXPECT_EQ(run.status, 2);
@@ -170,7 +170,7 @@ TEST_F(MofTest, APlugInThatFailsMakesTheListPartial) {
   EXPECT_EQ(Run({"classes"}).status, 1);
 }
 
-TEST_F(MofTest, NoClassIsAnError) {
+TEST_F(MofTest, ASchemaWithoutClassesIsAnError) {
   WriteFile(fZep.Path("empty.mof"), "// nothing\n");
   TRun const run = Run({"classes", "--mof", "empty.mof"});
   EXPECT_EQ(run.status, 1);
@@ -227,7 +227,7 @@ TEST_F(MofTest, AnUndeclaredObjectIsAnError) {
   EXPECT_EQ(run.errors, "zep: disks.mof has no object \"X_Tape\"\n");
 }
 
-TEST_F(MofTest, AFailureIsADocumentToo) {
+TEST_F(MofTest, AFailureIsAlsoPrintedAsADocument) {
   std::vector<std::vector<std::string>> const calls = {
       {"mof", "--json", "none.mof"}, {"classes", "--json", "--mof", "none.mof"}, {"show", "--json", "X", "--mof", "none.mof"}};
   std::string const why = "none.mof: cannot be read: No such file or directory";
@@ -291,7 +291,7 @@ TEST_F(MofTest, TheRealSchemaIsCountedAndShown) {
   EXPECT_EQ(counts["classes"], 1631);
   EXPECT_EQ(counts["indications"], 24);
   TRun const tree = Run({"classes", "--tree", "--mof", schema.MainFile()});
-  EXPECT_THAT(tree.output, HasSubstr("\n                  CIM_VTOCDiskPartition\n"));  // nine steps down
+  EXPECT_THAT(tree.output, HasSubstr("\n                  CIM_VTOCDiskPartition\n"));  // nine levels below the root
   TRun const shown = Run({"show", "CIM_ManagedSystemElement", "--mof", schema.MainFile()});
   EXPECT_THAT(shown.output, HasSubstr("\nHealthState               0 (Unknown), 5 (OK), 10 (Degraded/Warning)"));
 }

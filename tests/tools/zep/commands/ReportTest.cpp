@@ -20,7 +20,7 @@ using testing::IsEmpty;
 using testing::Not;
 using testing::StartsWith;
 
-// The rows of one table of the report, each a vector of cells. Cells of several lines are joined with blanks; `widths` are the
+// The rows of one table of the report, each a vector of cells. The lines of a cell are joined with blanks. `widths` are the
 // widths of the columns.
 std::vector<std::vector<std::string>> RowsOf(std::string const& text, std::string const& title,
                                              std::vector<std::size_t> const& widths) {
@@ -164,7 +164,7 @@ TEST_F(ReportTest, AProductNameWithoutModelIsReportedAsSuch) {
   EXPECT_EQ(LinesOf(run.output)[0], "db1: Server X1, type 1234, model unknown, serial number KQ12345");
 }
 
-// Forms that the firmware of many manufacturers has; the texts are invented.
+// The forms of serial numbers that the firmware of many manufacturers uses; the texts are invented.
 TEST_F(ReportTest, SerialNumbersOfAllManufacturersAreShownAndCompleteTheIdentity) {
   std::string const longest = "XVM-42 1f 9a 3c 5d 7e 80 21-b3 c4 d5 e6 f7 08 19 2a 3b";
   ASSERT_EQ(longest.size(), 54u);
@@ -214,7 +214,7 @@ TEST_F(ReportTest, SerialNumbersOfAllManufacturersAreShownAndCompleteTheIdentity
   }
 }
 
-TEST_F(ReportTest, ASerialNumberOfAnotherFormCompletesTheIdentityOfAnOwnMachine) {
+TEST_F(ReportTest, ASerialNumberOfAnotherFormCompletesTheIdentity) {
   TRun const run = Report(fZep.Table(SystemInformation("Server Q100 -[1234AB7]-", "9000116105") + EndOfTable()));
   EXPECT_EQ(run.status, 0);
   EXPECT_EQ(LinesOf(run.output)[0], "db1: Server Q100, type 1234, model AB7, serial number 9000116105");
@@ -283,7 +283,7 @@ TEST_F(ReportTest, TwoKindsOfProcessorAndModulesOfUnknownSizeAreDistinguished) {
   EXPECT_EQ(ValueIn(run.output, "Memory"), "512 MiB in 2 modules, 1 of them of unknown size");
 }
 
-// ---- Why there are no tables ----
+// ---- Reasons for missing tables ----
 
 TEST_F(ReportTest, AnUnreadableTableFileHasAReason) {
   TRun const missing = Report(fZep.Path("nothing"));
@@ -415,7 +415,7 @@ TEST_F(ReportTest, JsonHasTheReasonForANullProperty) {
     EXPECT_EQ(instance["properties"]["Name"]["key"], true);
     return;
   }
-  FAIL() << "no computer system";
+  FAIL() << "the document has no computer system";
 }
 
 // ---- The sample ----
@@ -556,7 +556,7 @@ TEST_F(ReportTest, AProviderThatFailsIsReportedAndStopsNoOther) {
   }
 }
 
-TEST_F(ReportTest, WhatTheLogSaysOfAFailureIsToldWithIt) {
+TEST_F(ReportTest, TheReasonOfAFailureIsReported) {
   TRun const run = RunWithTestProvider("is-refused", {"--json"});
   EXPECT_EQ(run.status, 2);
   std::string const error = JsonOf(run)["plugIns"][1]["providers"][0]["error"];
@@ -633,7 +633,7 @@ TEST_F(ReportTest, OddValuesOfAProviderMakeOneValidDocument) {
     if (instance["class"] != "X_Odd") continue;
     auto const& properties = instance["properties"];
     EXPECT_EQ(properties["Text"]["value"], "\x1b]0;title\x07 \xe2\x80\xae reversed");
-    EXPECT_EQ(properties["Bytes"]["value"], "\xef\xbf\xbd\xef\xbf\xbd no UTF-8");
+    EXPECT_EQ(properties["Bytes"]["value"], "\xef\xbf\xbd\xef\xbf\xbd not UTF-8");
     EXPECT_EQ(properties["Flag"]["value"], true);
     EXPECT_EQ(properties["Large"]["value"], "18446744073709551615");
     EXPECT_EQ(properties["Small"]["value"], "-9223372036854775808");
@@ -647,7 +647,7 @@ TEST_F(ReportTest, OddValuesOfAProviderMakeOneValidDocument) {
     EXPECT_EQ(properties["Nothing"]["source"], "provider Test");
     return;
   }
-  FAIL() << "no odd instance";
+  FAIL() << "the document has no odd instance";
 }
 
 TEST_F(ReportTest, TablesFitIntoEightyColumns) {
@@ -655,7 +655,7 @@ TEST_F(ReportTest, TablesFitIntoEightyColumns) {
   for (TRun const& run : {Report(fZep.Table(SystemInformation(std::string(300, 'x'), std::string(200, 'y')) + EndOfTable())),
                           fZep.Run({{"report", "--sample"}}), Run({}, {})}) {
     auto const lines = LinesOf(run.output);
-    bool isTable = false;  // the head lines come before the first empty line
+    bool isTable = false;  // the head lines precede the first empty line
     for (std::string const& line : lines) {
       isTable = isTable || line.empty();
       if (!isTable) continue;
@@ -666,7 +666,7 @@ TEST_F(ReportTest, TablesFitIntoEightyColumns) {
 
 // ---- Where the output goes ----
 
-TEST_F(ReportTest, AClosedPipeEndsItQuietly) {
+TEST_F(ReportTest, AClosedPipeEndsZepSilently) {
   int ends[2];
   ASSERT_EQ(::pipe(ends), 0);
   ::close(ends[0]);
@@ -685,7 +685,7 @@ TEST_F(ReportTest, AClosedPipeEndsItQuietly) {
 }
 
 TEST_F(ReportTest, AFullDiskIsAnError) {
-  if (!fs::exists("/dev/full")) GTEST_SKIP() << "no /dev/full";
+  if (!fs::exists("/dev/full")) GTEST_SKIP() << "/dev/full is missing";
   TCall call;
   call.arguments = {"report", "--json", "--sample"};
   call.outputFile = "/dev/full";

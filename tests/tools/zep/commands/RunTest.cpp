@@ -76,7 +76,7 @@ TEST_F(RunTest, ReportsThatACommandFailed) {
   EXPECT_EQ(run.errors, "zep: /nonexistent does not exist\n");
 }
 
-// zep inherits the setting, with which the system discards the exit status of children.
+// zep inherits this setting, which makes the system discard the exit status of children.
 TEST_F(RunTest, ACallerThatIgnoresItsChildrenMakesNoDifference) {
   TCall call = {{"run", "echo", "done"}};
   call.ignoresChildren = true;
@@ -85,7 +85,7 @@ TEST_F(RunTest, ACallerThatIgnoresItsChildrenMakesNoDifference) {
   EXPECT_EQ(run.output, "done\n");
 }
 
-// Blocks them for this process and its children.
+// Blocks signals for this process and its children.
 class TBlockedSignals {
 public:
   TBlockedSignals() {

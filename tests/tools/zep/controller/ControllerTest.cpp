@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// zep remote without a controller: how it is called, where the password comes from, what it prints.
+// Tests zep remote without a controller: its arguments, the sources of the password, and its output.
 
 #include "tests/tools/zep/Envelope.h"
 #include "tests/tools/zep/Zep.h"
@@ -50,7 +50,7 @@ TEST(RemoteIdentityTextTest, FieldsSentByAProcessThatDidNotFinishAreKept) {
     std::string sent, type, model, serialNumber;
   } const rows[] = {
       {"", "", "", ""},
-      {"12", "", "", ""},  // a field without its end may be cut
+      {"12", "", "", ""},  // a field without its end may be truncated
       {"1234\0AB"s, "1234", "", ""},
       {"1234\0AB7\0"s, "1234", "AB7", ""},
       {kSaid, "1234", "AB7", "KQ12345"},
@@ -153,7 +153,7 @@ TEST_F(ZepRemoteTest, AFileOfHostsThatCannotBeUsedIsReported) {
   EXPECT_EQ(Run({"--hosts", empty, "--user", "u"}, fPassword).errors, "zep: " + empty + " names no host\n");
 }
 
-TEST_F(ZepRemoteTest, AFileOfHostsThatFailsWhileItIsReadIsNotTakenForItsEnd) {
+TEST_F(ZepRemoteTest, AReadErrorInTheFileOfHostsIsNotTheEndOfTheFile) {
   struct TRow {
     std::string path, reason;
   };
@@ -165,7 +165,7 @@ TEST_F(ZepRemoteTest, AFileOfHostsThatFailsWhileItIsReadIsNotTakenForItsEnd) {
   }
 }
 
-TEST_F(ZepRemoteTest, WithoutATerminalThePasswordMustComeFromElsewhere) {
+TEST_F(ZepRemoteTest, WithoutATerminalThePasswordNeedsAnotherSource) {
   TRun const run = Run({"host", "--user", "u"});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: there is no terminal to ask for the password: set ZEP_BMC_PASSWORD or use --password-file\n");
@@ -180,18 +180,18 @@ TEST_F(ZepRemoteTest, WithoutATerminalThePasswordMustComeFromElsewhere) {
   EXPECT_EQ(Run({"host", "--user", "u", "--password-file", Private(File("password", "zeppass1\n"))}).errors,
             "zep: host: " + kNothing + "\n");
   EXPECT_EQ(Run({"host", "--user", "u"}, {{"ZEP_BMC_PASSWORD", ""}}).errors, "zep: host: " + kNothing + "\n")
-      << "an empty one is one";
+      << "an empty password is a password";
 }
 
-TEST_F(ZepRemoteTest, ADebugLogHoldsNoPassword) {
+TEST_F(ZepRemoteTest, ADebugLogContainsNoPassword) {
   std::string const log = fZep.Path("log");
   TRun const run = Run({"host", "--user", "u", "--debug-log", log}, fPassword);
-  EXPECT_EQ(run.errors, "zep: host: " + kNothing + "\n") << "so it is not warned of";
+  EXPECT_EQ(run.errors, "zep: host: " + kNothing + "\n") << "the debug log needs no warning";
   EXPECT_THAT(ReadFile(log), HasSubstr("FDR_[Debug] "));
   EXPECT_EQ((run.errors + run.output + ReadFile(log)).find("zeppass1"), std::string::npos);
 }
 
-TEST_F(ZepRemoteTest, ADebugLogIsForItsOwnerOnly) {
+TEST_F(ZepRemoteTest, ADebugLogIsReadableOnlyByItsOwner) {
   std::string const log = File("log", "from before");
   fs::permissions(log, static_cast<fs::perms>(0644));
   Run({"host", "--user", "u", "--debug-log", log}, fPassword);
@@ -201,7 +201,7 @@ TEST_F(ZepRemoteTest, ADebugLogIsForItsOwnerOnly) {
   EXPECT_EQ(fs::status(log + "2").permissions(), static_cast<fs::perms>(0600));
 }
 
-TEST_F(ZepRemoteTest, ADebugLogIsARegularFileOfTheCaller) {
+TEST_F(ZepRemoteTest, ADebugLogMustBeARegularFileOfTheCaller) {
   std::string const victim = File("victim", "untouched"), link = fZep.Path("link"), fifo = fZep.Path("fifo");
   fs::create_symlink(victim, link);
   fs::create_hard_link(victim, fZep.Path("second"));
@@ -218,7 +218,7 @@ TEST_F(ZepRemoteTest, ADebugLogIsARegularFileOfTheCaller) {
   EXPECT_EQ(ReadFile(victim), "untouched");
 }
 
-TEST_F(ZepRemoteTest, AFileOfAnotherUserIsNoDebugLog) {
+TEST_F(ZepRemoteTest, AFileOfAnotherUserIsRefusedAsDebugLog) {
   NEEDS(::geteuid() == 0, "root, who may write another user's file");
   std::string const log = File("log", "untouched");
   ASSERT_EQ(::chown(log.c_str(), 65534, 65534), 0);
@@ -227,7 +227,7 @@ TEST_F(ZepRemoteTest, AFileOfAnotherUserIsNoDebugLog) {
   EXPECT_EQ(ReadFile(log), "untouched");
 }
 
-TEST_F(ZepRemoteTest, APasswordFileThatEveryUserMayReadIsWarnedOf) {
+TEST_F(ZepRemoteTest, APasswordFileReadableByEveryUserCausesAWarning) {
   std::string const file = File("password", "zeppass1\n");
   fs::permissions(file, static_cast<fs::perms>(0644));
   TRun const run = Run({"host", "--user", "u", "--password-file", file});
@@ -248,9 +248,9 @@ TEST_F(ZepRemoteTest, AHostWithAPasswordIsNotQueried) {
   EXPECT_THAT(list.output + list.errors, Not(HasSubstr("topsecret")));
 }
 
-// ---- The password of a process that runs ----
+// ---- The password of a running process ----
 
-// Calls of zep that go on for a while, as a user without privileges.
+// Runs zep as a user without privileges, for long enough to inspect its processes.
 class ZepSecretProcessTest : public ZepRemoteTest {
 protected:
   void SetUp() override {
@@ -263,7 +263,7 @@ protected:
     ::waitpid(fZepProcess, nullptr, 0);
   }
 
-  // zep as nobody, with a controller that does not answer; returns once the process that asks it is there.
+  // Starts zep as nobody, with a controller that does not respond. Returns once the child process that queries it exists.
   void Start() {
     fZepProcess = ::fork();
     if (fZepProcess == 0) {
@@ -287,7 +287,7 @@ protected:
     return ::stat(("/proc/" + process + "/environ").c_str(), &status) == 0 ? status.st_uid : ~0u;
   }
 
-  // errno of an attempt of the same user to trace the process; 0 when it succeeds.
+  // The errno of the same user's attempt to trace the process; 0 when it succeeds.
   static int TraceOf(std::string const& process) {
     pid_t const tracer = ::fork();
     if (tracer == 0) {
@@ -300,10 +300,10 @@ protected:
   }
 
   pid_t fZepProcess = 0;
-  std::string fChild;  // the process that asks the controller
+  std::string fChild;  // the process that queries the controller
 };
 
-TEST_F(ZepSecretProcessTest, TheEnvironmentShowsNoPassword) {
+TEST_F(ZepSecretProcessTest, TheEnvironmentDoesNotContainThePassword) {
   Start();
   for (std::string const& process : {std::to_string(fZepProcess), fChild}) {
     std::string const environment = ReadFile("/proc/" + process + "/environ");
@@ -312,10 +312,10 @@ TEST_F(ZepSecretProcessTest, TheEnvironmentShowsNoPassword) {
   }
 }
 
-TEST_F(ZepSecretProcessTest, NoProcessOfTheSameUserLooksIntoIt) {
+TEST_F(ZepSecretProcessTest, AnotherProcessOfTheSameUserCannotInspectIt) {
   Start();
   for (std::string const& process : {std::to_string(fZepProcess), fChild}) {
-    EXPECT_EQ(OwnerOf(process), 0u) << "so it is dumped nowhere";
+    EXPECT_EQ(OwnerOf(process), 0u) << "root owns the /proc files of a process that cannot be dumped";
     EXPECT_EQ(TraceOf(process), EPERM);
   }
 }
@@ -365,8 +365,8 @@ TEST_F(ZepRemoteTest, EachErrorOfTheClientLibraryHasItsReason) {
   }
 }
 
-// A user name and a password that look like lines of the log.
-TEST_F(ZepRemoteTest, NeitherUserNorPasswordPassesForACode) {
+// The user name and the password look like lines of the log.
+TEST_F(ZepRemoteTest, UserAndPasswordAreNotMistakenForACode) {
   fZep.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
   std::string const forged = "x\nFDR_[Debug] 1/1/2026  0:0:0 Connection Error code:3\n";
   TRun const run = Run({"host", "--user", forged}, {{"ZEP_BMC_PASSWORD", forged}, {"FAKE_IPMI_CODE", "1"}});
@@ -396,7 +396,7 @@ struct TSession {
   std::string shown;
 };
 
-// Runs zep at a terminal of its own and types the text once something is asked.
+// Runs zep at a new terminal and types the text at the first prompt.
 TSession TypeAt(TInstallation const& zep, std::string const& typed) {
   std::string const program = zep.Path("bin/zep");
   int terminal = -1;
@@ -422,7 +422,7 @@ TSession TypeAt(TInstallation const& zep, std::string const& typed) {
   return session;
 }
 
-TEST_F(ZepRemoteTest, ThePasswordIsAskedForWithoutEcho) {
+TEST_F(ZepRemoteTest, ThePasswordIsReadWithoutEcho) {
   TSession const session = TypeAt(fZep, "zeppass1\n");
   EXPECT_EQ(session.status, 1);
   EXPECT_THAT(session.shown, testing::StartsWith("Password of zepadmin: \r\nRemote server"));
@@ -430,13 +430,13 @@ TEST_F(ZepRemoteTest, ThePasswordIsAskedForWithoutEcho) {
   EXPECT_EQ(session.shown.find("zeppass1"), std::string::npos);
 }
 
-TEST_F(ZepRemoteTest, AnInterruptInsteadOfThePasswordEndsIt) {
+TEST_F(ZepRemoteTest, AnInterruptAtThePasswordPromptEndsZep) {
   TSession const session = TypeAt(fZep, "zepp\x03");
   EXPECT_EQ(session.status, 128 + SIGINT);
   EXPECT_EQ(session.shown, "Password of zepadmin: \r\n");
 }
 
-TEST_F(ZepRemoteTest, WithoutAPasswordNothingIsAsked) {
+TEST_F(ZepRemoteTest, WithoutAPasswordNoControllerIsQueried) {
   TSession const session = TypeAt(fZep, "\x04");
   EXPECT_EQ(session.status, 1);
   EXPECT_EQ(session.shown, "Password of zepadmin: \r\nzep: no password was given\r\n");

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// zep media: names, what lsblk, blkid and the kernel write, and the command run with programs that stand in for them. Real
-// media are mounted in tests/system/media.
+// Tests zep media: names, the output of lsblk, blkid and the kernel, and the command with stand-ins for these programs.
+// tests/system/media tests it with real media.
 
 #include "tools/zep/media/Media.h"
 
@@ -23,7 +23,7 @@ std::string Sample() { return ReadFile(ZEP_TEST_DATA_DIR "/lsblk/devices.json");
 
 // ---- Names ----
 
-TEST(MediaTest, APlainPathMeansNothingToTheShell) {
+TEST(MediaTest, APlainPathHasNoCharacterThatTheShellInterprets) {
   for (char const* name : {"/dev/sdb", "/dev/disk/by-id/usb-A_b-0.1", "/dev/..x", "/a..", "/dev/sdb.", "/"})
     EXPECT_TRUE(IsPlainPath(name)) << name;
   for (char const* name : {"",           "dev/sdb",       "/dev/sdb ",   "/dev/sd b",  "/dev/sd;b",  "/dev/sd&b", "/dev/$b",
@@ -48,7 +48,7 @@ TEST(MediaTest, TrailingSlashesAreStripped) {
   for (TRow const& row : rows) EXPECT_EQ(WithoutTrailingSlashes(row.name), row.stripped) << row.name;
 }
 
-TEST(MediaTest, ADeviceIsBelowDevAndThere) {
+TEST(MediaTest, ADeviceMustExistBelowDev) {
   EXPECT_NO_THROW(CheckDevice("/dev/null"));
   for (char const* name : {"/etc/passwd", "/dev", "/dev/", "/devx/sdb", "/dev/null;x", "/dev/../etc/passwd", "", "null"})
     EXPECT_THROW(CheckDevice(name), std::runtime_error) << name;
@@ -58,9 +58,9 @@ TEST(MediaTest, ADeviceIsBelowDevAndThere) {
     CheckDevice("/dev/no-such-device");
     FAIL();
   } catch (TWrongUsage const&) {
-    FAIL() << "a name that is fit";
+    FAIL() << "the name itself is valid";
   } catch (std::runtime_error const& failure) {
-    EXPECT_STREQ(failure.what(), "there is no device /dev/no-such-device");
+    EXPECT_STREQ(failure.what(), "the device /dev/no-such-device does not exist");
   }
 }
 
@@ -83,7 +83,7 @@ TEST(MediaTest, RemovableDrivesAndTheirPartitionsAreMedia) {
                           "/dev/sr0|QEMU CD-ROM|||2097152|ro", "/dev/sr1|Example Virtual CDROM|||1048576|ro"));
 }
 
-TEST(MediaTest, ADriveIsRemovableOrOnTheUsb) {
+TEST(MediaTest, RemovableDrivesAndUsbDrivesAreListed) {
   struct TRow {
     char const* fields;
     bool isMedium;
@@ -103,7 +103,7 @@ TEST(MediaTest, ADriveIsRemovableOrOnTheUsb) {
         << row.fields;
 }
 
-TEST(MediaTest, APartitionIsShownForItself) {
+TEST(MediaTest, EachPartitionIsListedSeparately) {
   EXPECT_THAT(TextsOf(MediaIn(R"(lsblk: a warning
 {"blockdevices":[{"name":"/dev/sdb","type":"disk","size":9,"rm":true,"vendor":"Maker ","model":"Key","fstype":"iso9660",
  "label":"LIVE","mountpoints":[null],"children":[
@@ -113,7 +113,7 @@ TEST(MediaTest, APartitionIsShownForItself) {
                           "/dev/sdb2|Maker Key|||4"));
 }
 
-TEST(MediaTest, AnOpenedVolumeIsMountedWhereItLies) {
+TEST(MediaTest, TheMountPointOfAnOpenedVolumeBelongsToItsMedium) {
   EXPECT_THAT(TextsOf(MediaIn(R"({"blockdevices":[
  {"name":"/dev/sdb","type":"disk","rm":true,"mountpoints":[null],"children":[
   {"name":"/dev/sdb1","type":"part","fstype":"crypto_LUKS","mountpoints":[null],"children":[
@@ -136,7 +136,7 @@ TEST(MediaTest, OnlyRomDrivesAreOptical) {
   EXPECT_THAT(optical, ElementsAre("/dev/sr0", "/dev/sr1"));
 }
 
-TEST(MediaTest, WhatIsNoListIsAnError) {
+TEST(MediaTest, OtherOutputOfLsblkIsAnError) {
   for (char const* text : {"", "nothing", "{", "[]", "{}", "{\"blockdevices\":1}", "{\"blockdevices\":[]} x"})
     EXPECT_THROW(MediaIn(text), std::runtime_error) << text;
   EXPECT_THAT(MediaIn("{\"blockdevices\":[]}"), IsEmpty());
@@ -154,7 +154,7 @@ TEST(MediaTest, LabelAndFileSystemAreTakenFromBlkid) {
 
 // ---- mountinfo ----
 
-TEST(MediaTest, AMountIsFoundByItsWholeMountPoint) {
+TEST(MediaTest, AMountIsFoundByItsCompleteMountPoint) {
   std::string const info =
       "22 27 0:21 / /proc rw,relatime - proc proc rw\n"
       "40 27 8:17 / /mnt/key rw,noatime shared:1 master:2 - vfat /dev/sdb1 rw,fmask=0022\n"
@@ -172,7 +172,7 @@ TEST(MediaTest, AMountIsFoundByItsWholeMountPoint) {
       {"/mnt/key", "/dev/sdb1", 8, 17, false},
       {"/mnt/key2", "/dev/sdc", 8, 32, true},
       {"/media/a b", "/dev/disk 1", 11, 0, true},
-      {"/mnt/floppy", "/dev/loop5", 7, 5, false},  // the later one lies on top
+      {"/mnt/floppy", "/dev/loop5", 7, 5, false},  // the later mount is on top
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.directory);
@@ -215,16 +215,16 @@ protected:
 };
 
 TEST_F(MediaCommandTest, ListsMediaAsATable) {
-  // Optical drives that no machine has: those of this one may be empty.
+  // The stand-in renames the optical drives to names that no machine has, because this machine's drives may be empty.
   AddStandIn("lsblk", "sed s,/dev/sr,/dev/xr, " ZEP_TEST_DATA_DIR "/lsblk/devices.json");
   AddStandIn("blkid", "test $4 != /dev/sdb1 || printf 'LABEL=STICK\\nTYPE=vfat\\n'");
-  if (fs::exists("/run/udev/data")) GTEST_SKIP() << "where udev runs, blkid is not asked";
-  NEEDS(::geteuid() == 0, "only root asks blkid");
+  if (fs::exists("/run/udev/data")) GTEST_SKIP() << "zep does not run blkid where udev runs";
+  NEEDS(::geteuid() == 0, "zep runs blkid only as root");
   for (std::vector<std::string> const& arguments : {std::vector<std::string>{}, std::vector<std::string>{"list"}}) {
     TRun const run = Run(arguments);
     EXPECT_EQ(run.status, 0) << run.errors;
     EXPECT_EQ(run.output,
-              "Device        Size       Label        File system  Mounted at    What it is\n"
+              "Device        Size       Label        File system  Mounted at    Description\n"
               "/dev/fd0      -          -            -            -             -\n"
               "/dev/sdb1     7 MiB      STICK        vfat         -             QEMU HARDDISK\n"
               "/dev/sdc      4 MiB      -            -            -             Example Virtual\n"
@@ -236,7 +236,7 @@ TEST_F(MediaCommandTest, ListsMediaAsATable) {
   }
 }
 
-TEST_F(MediaCommandTest, ATableTellsSizesAndWhereMediaAreMounted) {
+TEST_F(MediaCommandTest, TheTableShowsSizesAndMountPoints) {
   struct TRow {
     std::string size, shown;
   };
@@ -273,42 +273,42 @@ TEST_F(MediaCommandTest, ListsMediaAsJson) {
   }
 }
 
-TEST_F(MediaCommandTest, WithoutMediaThereIsNothing) {
+TEST_F(MediaCommandTest, WithoutMediaTheStatusIsOne) {
   AddStandIn("lsblk", "echo '{\"blockdevices\":[]}'");
   TRun const run = Run({});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: there is no removable medium\n");
+  EXPECT_EQ(run.errors, "zep: no removable medium was found\n");
   TRun const asJson = Run({"--json"});
   EXPECT_EQ(asJson.status, 1);
   EXPECT_THAT(JsonOf(asJson)["media"], IsEmpty());
 }
 
-TEST_F(MediaCommandTest, SaysWhatIsWrongWithLsblk) {
+TEST_F(MediaCommandTest, AFailureOfLsblkIsReported) {
   AddStandIn("lsblk", "echo 'lsblk: no sysfs' >&2; exit 1");
   TRun run = Run({});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.errors, "zep: lsblk failed: lsblk: no sysfs\n");
   AddStandIn("lsblk", "exit 1");
-  EXPECT_EQ(Run({}).errors, "zep: lsblk cannot be run, or fails and says nothing; the package util-linux has it\n");
+  EXPECT_EQ(Run({}).errors, "zep: lsblk is missing, or failed without a message; it is in the package util-linux\n");
   AddStandIn("lsblk", "echo usage");
   run = Run({});
   EXPECT_EQ(run.status, 1);
-  EXPECT_THAT(run.errors, StartsWith("zep: lsblk printed something else than its list: usage"));
+  EXPECT_THAT(run.errors, StartsWith("zep: lsblk did not print its list as JSON, but: usage"));
 }
 
-TEST_F(MediaCommandTest, SaysWhenLabelsCannotBeRead) {
+TEST_F(MediaCommandTest, UnreadableLabelsAreReported) {
   if (fs::exists("/run/udev/data")) GTEST_SKIP() << "where udev runs, everyone can read labels";
   AddStandIn("lsblk", "cat " ZEP_TEST_DATA_DIR "/lsblk/devices.json");
-  AddStandIn("blkid", "echo LABEL=never asked");
+  AddStandIn("blkid", "echo LABEL=never read");
   TRun const run = Run({"--json"}, true);
   EXPECT_EQ(run.status, 2);
-  EXPECT_EQ(run.errors, "zep: labels and file systems can be read by root only\n");
+  EXPECT_EQ(run.errors, "zep: only root can read labels and file systems\n");
   EXPECT_EQ(JsonOf(run)["labelsReadable"], false);
   EXPECT_EQ(JsonOf(run)["media"][1]["label"], nullptr);
 }
 
-TEST_F(MediaCommandTest, RefusesNamesBeforeAnythingIsRun) {
+TEST_F(MediaCommandTest, InvalidNamesAreRefusedBeforeAnyProgramRuns) {
   for (char const* program : {"mount", "umount"}) AddStandIn(program, "echo run >> " + fInstallation.Path("run"));
   struct TRow {
     std::vector<std::string> arguments;
@@ -316,11 +316,11 @@ TEST_F(MediaCommandTest, RefusesNamesBeforeAnythingIsRun) {
     char const* errors;
   };
   TRow const rows[] = {
-      {{"mount", "/dev/sdb;reboot"}, 64, "zep: \"/dev/sdb;reboot\" is not a name of a device"},
-      {{"mount", "/etc/passwd"}, 64, "zep: \"/etc/passwd\" is not a name of a device"},
-      {{"mount", "/dev/../etc/passwd"}, 64, "zep: \"/dev/../etc/passwd\" is not a name of a device"},
-      {{"mount", "/dev/$HOME"}, 64, "zep: \"/dev/$HOME\" is not a name of a device"},
-      {{"mount", "/dev/no-such-device"}, 1, "zep: there is no device /dev/no-such-device"},
+      {{"mount", "/dev/sdb;reboot"}, 64, "zep: \"/dev/sdb;reboot\" is not a device name"},
+      {{"mount", "/etc/passwd"}, 64, "zep: \"/etc/passwd\" is not a device name"},
+      {{"mount", "/dev/../etc/passwd"}, 64, "zep: \"/dev/../etc/passwd\" is not a device name"},
+      {{"mount", "/dev/$HOME"}, 64, "zep: \"/dev/$HOME\" is not a device name"},
+      {{"mount", "/dev/no-such-device"}, 1, "zep: the device /dev/no-such-device does not exist"},
       {{"umount", "/mnt/key;reboot"}, 64, "zep: \"/mnt/key;reboot\" is not a mount point of a medium"},
       {{"umount", "/"}, 64, "zep: \"/\" is not a mount point of a medium"},
       {{"umount", "/home"}, 64, "zep: \"/home\" is not a mount point of a medium"},
@@ -342,16 +342,16 @@ TEST_F(MediaCommandTest, RefusesNamesBeforeAnythingIsRun) {
   EXPECT_FALSE(fs::exists(fInstallation.Path("run")));
 }
 
-TEST_F(MediaCommandTest, AReportGoesToNoOtherNameThanThatOfADevice) {
+TEST_F(MediaCommandTest, AReportIsWrittenOnlyToADeviceName) {
   for (char const* name : {"/tmp", "/dev/sdb;x", "key"}) {
     TRun const run = fInstallation.Run({{"report", "--sample", "--to-media", name}});
     EXPECT_EQ(run.status, 64) << name;
-    EXPECT_THAT(run.errors, HasSubstr("is not a name of a device"));
+    EXPECT_THAT(run.errors, HasSubstr("is not a device name"));
     EXPECT_EQ(run.output, "");
   }
   TRun const run = fInstallation.Run({{"report", "--sample", "--to-media", "/dev/no-such-device"}});
   EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: there is no device /dev/no-such-device\n");
+  EXPECT_EQ(run.errors, "zep: the device /dev/no-such-device does not exist\n");
 }
 
 }  // namespace

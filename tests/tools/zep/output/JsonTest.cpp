@@ -11,7 +11,7 @@ namespace {
 
 using TType = TCIMValue::TCIMType;
 
-TEST(JsonTest, ValuesBecomeTheirKindOfJson) {
+TEST(JsonTest, EachKindOfValueHasItsKindOfJson) {
   std::vector<TCIMValue> const elements = {"a", TCIMValue(TType::kCIMTypeString, 0)};
   struct TRow {
     TCIMValue value;

@@ -12,7 +12,7 @@ namespace {
 using testing::ElementsAre;
 using TProcessors = std::vector<TProcessorKind>;
 
-TEST(ReportPhrasesTest, ValuesAreWorded) {
+TEST(ReportPhrasesTest, ValuesArePutIntoWords) {
   struct TRow {
     TReportValue value;
     char const* text;

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// The output of zep on a terminal: as wide as the terminal, and in plain lines on a dumb one.
+// Tests the output of zep on a terminal: it is as wide as the terminal, and consists of plain lines on a dumb one.
 
 #include "tools/zep/output/Terminal.h"
 
@@ -26,7 +26,7 @@ TEST(TerminalTest, ColumnsAreANumberThatATerminalCanHave) {
 
 class AtTerminalTest : public testing::Test {
 protected:
-  // The output of zep on a terminal of that many columns, without the carriage returns of the line ends.
+  // Returns the output of zep on a terminal with that many columns, without the carriage returns of the line ends.
   std::string Shown(std::vector<std::string> const& arguments, unsigned short columns,
                     std::map<std::string, std::string> const& environment = {}) {
     winsize size{};
@@ -73,7 +73,7 @@ TEST_F(AtTerminalTest, ATableIsAsWideAsTheTerminal) {
   std::vector<std::string> const call = {"show", "X_A", "--mof", fZep.Path("a.mof")};
   EXPECT_LE(LongestLineOf(Shown(call, 80)), 80u);
   EXPECT_THAT(Shown(call, 80), Not(HasSubstr(kWords)));
-  EXPECT_THAT(Shown(call, 160), HasSubstr(kWords)) << "there is room for it";
+  EXPECT_THAT(Shown(call, 160), HasSubstr(kWords)) << "the terminal is wide enough for one line";
   EXPECT_LE(LongestLineOf(Shown(call, 60)), 60u);
   EXPECT_THAT(Shown(call, 60), HasSubstr("PropertyWithAName "));
 }
@@ -86,7 +86,7 @@ TEST_F(AtTerminalTest, ColumnsOverridesTheSystem) {
   EXPECT_LE(LongestLineOf(Shown(call, 80, {{"COLUMNS", "wide"}})), 80u);
 }
 
-TEST_F(AtTerminalTest, NoWordIsCut) {
+TEST_F(AtTerminalTest, NoWordIsTruncated) {
   for (unsigned short const columns : {40, 80}) {
     std::string const shown = Shown({"show", "CIM_PhysicalMemory", "--sample"}, columns);
     EXPECT_THAT(shown, HasSubstr("\nConfiguredMemoryClockSpeed ")) << columns;
@@ -119,7 +119,7 @@ TEST_F(AtTerminalTest, HelpIsAlsoACommand) {
   EXPECT_EQ(fZep.Run({{"help", "media", "mount"}}).output, fZep.Run({{"media", "mount", "--help"}}).output);
   TRun const wrong = fZep.Run({{"help", "bogus"}});
   EXPECT_EQ(wrong.status, 64);
-  EXPECT_EQ(wrong.errors, "zep: there is no such command; zep --help lists them\n");
+  EXPECT_EQ(wrong.errors, "zep: there is no such command; zep --help lists all commands\n");
 }
 
 }  // namespace

@@ -58,7 +58,7 @@ TEST(TextTest, ColumnsGiveUpUnneededWidth) {
   EXPECT_EQ(table.TextFor(ELayout::kFile, 20), "1234567890  one two\n            three\n            four\n");
 }
 
-TEST(TextTest, AWordThatTakesMostOfTheLineIsCut) {
+TEST(TextTest, AWordThatFillsMostOfTheLineIsBroken) {
   TTable table({4, 10, 4});
   table.Add({"a", "12345678901234567890", "b"});
   table.Add({"c", "1234567890 12345", "d"});

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// To be preloaded: a file that cannot be read from some byte on, as on a failing disk. ZEP_TEST_FAILING_FILE names it and
-// ZEP_TEST_FAILING_BYTE the byte, counted from 0.
+// A library to be preloaded. Reading the file ZEP_TEST_FAILING_FILE fails from the byte ZEP_TEST_FAILING_BYTE on, counted from 0,
+// as on a failing disk.
 
 #include <dlfcn.h>
 #include <limits.h>

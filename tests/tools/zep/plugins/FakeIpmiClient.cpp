@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Stands in for libipmiClient.so: opening fails with the code that the environment variable FAKE_IPMI_CODE names; after half
-// a minute for "wait".
+// A stand-in for libipmiClient.so. Opening a session returns the code in the environment variable FAKE_IPMI_CODE; when the
+// variable is "wait", opening fails after 30 seconds.
 
 #include "platform/include/ipmiClient.h"
 

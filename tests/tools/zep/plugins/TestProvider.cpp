@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// A provider plug-in with the behaviours that the environment variable ZEP_TEST_PROVIDER names, one word after the other.
+// A provider plug-in. The words in the environment variable ZEP_TEST_PROVIDER name its behaviours.
 
 #include "ICIMClass.h"
 #include "TNamespaceProviderManager.h"
@@ -41,7 +41,7 @@ void AddSystems(TMemoryNamespace& ns) {
   if (Does("two-systems")) AddSystem(ns, "two");
 }
 
-// Values of every kind, and texts that a terminal or a JSON reader would stumble over.
+// Values of every kind, and texts that could confuse a terminal or a JSON reader.
 void AddOddities(TMemoryNamespace& ns) {
   ns.DefineClass("X_Base").Key("Id", "string").Property("Inherited", "uint8");
   ns.DefineClass("X_Odd", "X_Base")
@@ -62,7 +62,7 @@ void AddOddities(TMemoryNamespace& ns) {
   auto const odd = ns.AddInstance("X_Odd", {{"Id", "quote \" and \\ and \x1b[31m"},
                                             {"Inherited", static_cast<unsigned char>(7)},
                                             {"Text", "\x1b]0;title\x07 \xe2\x80\xae reversed"},
-                                            {"Bytes", "\xff\xfe no UTF-8"},
+                                            {"Bytes", "\xff\xfe not UTF-8"},
                                             {"Flag", true},
                                             {"Large", std::numeric_limits<unsigned long>::max()},
                                             {"Small", std::numeric_limits<long>::min()},
@@ -74,14 +74,14 @@ void AddOddities(TMemoryNamespace& ns) {
   ns.AddInstance("X_Link", {{"Id", "1"}, {"Target", odd->GetReference()}});
 }
 
-// Instances whose paths do not tell them from the class, or hold bytes that are no UTF-8.
+// Instances whose paths are the same as that of the class, or contain bytes that are not UTF-8.
 void AddHardToName(TMemoryNamespace& ns) {
   ns.DefineClass("X_Note").Key("Id", "string").Property("Text", "string");
   ns.DefineClass("X_LateNote", "X_Note");
   ns.DefineClass("X_Plain").Property("Text", "string");
   ns.AddInstance("X_Note", {{"Text", "first"}});
   ns.AddInstance("X_Note", {{"Id", "1"}, {"Text", "with a key"}});
-  ns.AddInstance("X_LateNote", {{"Text", "of a class below"}});
+  ns.AddInstance("X_LateNote", {{"Text", "of a subclass"}});
   ns.AddInstance("X_Note", {{"Text", "second"}});
   ns.AddInstance("X_Plain", {{"Text", "plain"}});
 
@@ -95,7 +95,7 @@ void AddHardToName(TMemoryNamespace& ns) {
 
 void AddRefused(TMemoryNamespace& ns) {
   ns.DefineClass("X_Refused").Key("Id", "string").Property("Kind", "uint16");
-  ns.AddInstance("X_Refused", {{"Id", "1"}, {"Kind", "no number"}});
+  ns.AddInstance("X_Refused", {{"Id", "1"}, {"Kind", "not a number"}});
 }
 
 void Fill(TMemoryNamespace& ns) {
@@ -108,7 +108,7 @@ void Fill(TMemoryNamespace& ns) {
   if (Does("odd")) AddOddities(ns);
 }
 
-// Fails whenever a class is asked for by name, or all of them.
+// Fails on every request for a class by name, and on every enumeration of the classes.
 class TFailingNamespace : public TMemoryNamespace {
 public:
   using TMemoryNamespace::TMemoryNamespace;

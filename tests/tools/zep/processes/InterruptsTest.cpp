@@ -10,7 +10,7 @@
 namespace NQRVZEP20::zep {
 namespace {
 
-TEST(InterruptsTest, ASignalHasItsEffectAtTheEndOfTheGuard) {
+TEST(InterruptsTest, ASignalTakesEffectAtTheEndOfTheGuard) {
   for (int const signal : {SIGHUP, SIGINT, SIGTERM})
     EXPECT_EXIT(
         {
@@ -22,7 +22,7 @@ TEST(InterruptsTest, ASignalHasItsEffectAtTheEndOfTheGuard) {
         testing::KilledBySignal(signal), "^pending$");
 }
 
-// nohup, and a shell in the background, start programs with such signals.
+// nohup starts programs with ignored signals, and so does a shell that starts them in the background.
 TEST(InterruptsTest, AnIgnoredSignalStaysIgnored) {
   for (int const signal : {SIGHUP, SIGINT, SIGTERM})
     EXPECT_EXIT(

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Work in processes of its own.
+// Tests running work in child processes.
 
 #include "tools/zep/processes/Processes.h"
 
@@ -31,7 +31,7 @@ std::map<std::size_t, TProcessResult> ResultsOf(std::size_t count, TProcessLimit
   std::map<std::size_t, TProcessResult> results;
   auto const sendAll = [&](std::size_t item, TSend const& send) { send(work(item)); };
   RunInProcesses(count, limits, sendAll, [&](TProcessResult const& result) {
-    EXPECT_TRUE(results.emplace(result.fItem, result).second) << "twice the result of " << result.fItem;
+    EXPECT_TRUE(results.emplace(result.fItem, result).second) << "a second result for item " << result.fItem;
   });
   EXPECT_EQ(::waitpid(-1, nullptr, WNOHANG), -1) << "every process should have been waited for";
   EXPECT_EQ(errno, ECHILD);
@@ -54,13 +54,13 @@ TEST(ProcessesTest, WithoutItemsNothingRuns) {
   EXPECT_TRUE(ResultsOf(0, {4, 60}, [](std::size_t) { return ""; }).empty());
 }
 
-TEST(ProcessesTest, EachRunsInAProcessOfItsOwn) {
+TEST(ProcessesTest, EachItemRunsInItsOwnProcess) {
   auto const results = ResultsOf(3, {1, 60}, [](std::size_t) { return std::to_string(::getpid()); });
   EXPECT_NE(results.at(0).fOutput, results.at(1).fOutput);
   EXPECT_NE(results.at(0).fOutput, std::to_string(::getpid()));
 }
 
-TEST(ProcessesTest, AFailureStopsNoneOfTheOthers) {
+TEST(ProcessesTest, AFailureDoesNotStopTheOthers) {
   auto const results = ResultsOf(5, {2, 60}, [](std::size_t item) -> std::string {
     if (item == 1) throw std::runtime_error("no");
     if (item == 2) ::raise(SIGKILL);
@@ -75,7 +75,7 @@ TEST(ProcessesTest, AFailureStopsNoneOfTheOthers) {
   EXPECT_EQ(results.at(4).fOutput, "done");
 }
 
-// While it lives, so many more descriptors can be opened.
+// Limits the process to `count` more descriptors until it is destroyed.
 class TDescriptorsLeft {
 public:
   explicit TDescriptorsLeft(rlim_t count) {
@@ -93,23 +93,23 @@ private:
   rlimit fBefore{};
 };
 
-TEST(ProcessesTest, WhereNoFurtherOneCanBeMadeItWaitsForOneToEnd) {
-  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs descriptors of its own";
+TEST(ProcessesTest, WhenNoFurtherProcessCanBeCreatedItWaitsForOneToEnd) {
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer needs additional descriptors";
   TDescriptorsLeft const left(4);
   auto const results = ResultsOf(10, {10, 60}, [](std::size_t item) { return "item " + std::to_string(item); });
   ASSERT_EQ(results.size(), 10u);
   for (auto const& [item, result] : results) EXPECT_EQ(result.fOutput, "item " + std::to_string(item));
 }
 
-TEST(ProcessesTest, WhereNoneCanBeMadeEveryItemIsTold) {
-  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs descriptors of its own";
+TEST(ProcessesTest, WhenNoProcessCanBeCreatedEveryItemIsIncomplete) {
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer needs additional descriptors";
   TDescriptorsLeft const left(1);
   auto const results = ResultsOf(10, {10, 60}, [](std::size_t) { return "done"; });
   ASSERT_EQ(results.size(), 10u);
   for (auto const& [item, result] : results) EXPECT_FALSE(result.fIsComplete) << item;
 }
 
-TEST(ProcessesTest, OneWhoseTimeIsUpIsEnded) {
+TEST(ProcessesTest, AProcessIsKilledAtItsTimeLimit) {
   auto const start = TClock::now();
   auto const results = ResultsOf(3, {3, 1}, [](std::size_t item) {
     if (item == 1) Sleep(30000);
@@ -122,7 +122,7 @@ TEST(ProcessesTest, OneWhoseTimeIsUpIsEnded) {
   EXPECT_TRUE(results.at(2).fIsComplete);
 }
 
-TEST(ProcessesTest, NoMoreRunAtOnceThanAllowed) {
+TEST(ProcessesTest, NoMoreProcessesRunAtOnceThanAllowed) {
   auto const start = TClock::now();
   ResultsOf(6, {2, 60}, [](std::size_t) {
     Sleep(200);
@@ -131,7 +131,7 @@ TEST(ProcessesTest, NoMoreRunAtOnceThanAllowed) {
   EXPECT_GE(SecondsSince(start), 0.6);
 }
 
-TEST(ProcessesTest, ResultsComeAsSoonAsTheyAreThere) {
+TEST(ProcessesTest, EachResultIsPassedOnAsSoonAsItIsComplete) {
   std::vector<std::size_t> order;
   RunInProcesses(
       3, {3, 60}, [](std::size_t item, TSend const&) { Sleep(item == 0 ? 1000 : 0); },
@@ -140,7 +140,7 @@ TEST(ProcessesTest, ResultsComeAsSoonAsTheyAreThere) {
   EXPECT_EQ(order.back(), 0u);
 }
 
-TEST(ProcessesTest, TextSentBeforeTheTimeIsUpIsInTheResult) {
+TEST(ProcessesTest, TextSentBeforeTheTimeLimitIsInTheResult) {
   RunInProcesses(
       1, {1, 1},
       [](std::size_t, TSend const& send) {
@@ -156,13 +156,13 @@ TEST(ProcessesTest, TextSentBeforeTheTimeIsUpIsInTheResult) {
       });
 }
 
-TEST(ProcessesTest, ALongOutputIsTakenWhole) {
+TEST(ProcessesTest, ALongOutputIsComplete) {
   auto const results = ResultsOf(2, {2, 60}, [](std::size_t) { return std::string(1000000, 'x'); });
   EXPECT_EQ(results.at(0).fOutput.size(), 1000000u);
   EXPECT_EQ(results.at(1).fOutput.size(), 1000000u);
 }
 
-TEST(ProcessesTest, WhatEndsTheListEndsTheProcesses) {
+TEST(ProcessesTest, AnExceptionEndsTheProcesses) {
   auto const start = TClock::now();
   EXPECT_THROW(RunInProcesses(
                    2, {2, 60},

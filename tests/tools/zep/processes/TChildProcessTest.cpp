@@ -29,7 +29,7 @@ std::size_t OpenDescriptors() {
 
 bool IsAnyChildLeft() { return ::waitpid(-1, nullptr, WNOHANG) != -1; }
 
-TEST(TChildProcessTest, SaysWhatItsWorkReturns) {
+TEST(TChildProcessTest, SendsTheResultOfItsWork) {
   std::size_t const before = OpenDescriptors();
   TChildProcess child([] { return std::string(1000000, 'x') + std::to_string(::getpid()); }, SIGKILL);
   std::string const id = std::to_string(child.Id());
@@ -41,14 +41,14 @@ TEST(TChildProcessTest, SaysWhatItsWorkReturns) {
   EXPECT_FALSE(IsAnyChildLeft());
 }
 
-TEST(TChildProcessTest, WorkThatDoesNotComeToItsEndIsNotComplete) {
+TEST(TChildProcessTest, WorkThatDoesNotFinishIsIncomplete) {
   std::function<std::string()> const works[] = {
       []() -> std::string { throw std::runtime_error("no"); },
       []() -> std::string { throw 1; },
       []() -> std::string { ::_exit(3); },
       [] {
         ::raise(SIGKILL);
-        return std::string("never said");
+        return std::string("never sent");
       },
   };
   for (auto const& work : works) {
@@ -58,7 +58,7 @@ TEST(TChildProcessTest, WorkThatDoesNotComeToItsEndIsNotComplete) {
   }
 }
 
-TEST(TChildProcessTest, OneThatStillRunsIsKilledWithItsOwner) {
+TEST(TChildProcessTest, ARunningChildIsKilledWithItsOwner) {
   auto const Forever = [] {
     ::pause();
     return std::string();
@@ -78,21 +78,21 @@ TEST(TChildProcessTest, OneThatStillRunsIsKilledWithItsOwner) {
   EXPECT_EQ(OpenDescriptors(), before);
 }
 
-TEST(TChildProcessTest, IsToldTheSignalOfAnOrphan) {
+TEST(TChildProcessTest, TheChildGetsTheSignalOfAnOrphan) {
   for (int const signal : {SIGTERM, SIGKILL}) {
     TChildProcess child(
         [] {
-          int told = 0;
-          ::prctl(PR_GET_PDEATHSIG, &told);
-          return std::to_string(told);
+          int signalAtDeath = 0;
+          ::prctl(PR_GET_PDEATHSIG, &signalAtDeath);
+          return std::to_string(signalAtDeath);
         },
         signal);
     EXPECT_EQ(AllOf(child), std::to_string(signal));
   }
 }
 
-// Neither while it is read from nor while it is waited for.
-TEST(TChildProcessTest, ASignalDisturbsNothing) {
+// Signals arrive while one child is read from and while another is waited for.
+TEST(TChildProcessTest, SignalsDoNotDisturbReadingAndWaiting) {
   static std::atomic<int> signals;
   struct sigaction action {
   }, before;
@@ -118,9 +118,9 @@ TEST(TChildProcessTest, ASignalDisturbsNothing) {
   EXPECT_FALSE(IsAnyChildLeft());
 }
 
-// Ends a process of its own, in which a user without privileges may have no further process: with 0 when the constructor
-// throws and leaves nothing open.
-[[noreturn]] void MakeOneTooMany() {
+// For use in a child: makes the constructor fail, as a user without privileges who may create no further process. Exits with 0
+// when the constructor throws and leaves no descriptor open.
+[[noreturn]] void ExceedTheProcessLimit() {
   constexpr unsigned kNobody = 65534;
   if (::geteuid() == 0 && (::setgroups(0, nullptr) != 0 || ::setgid(kNobody) != 0 || ::setuid(kNobody) != 0)) ::_exit(1);
   rlimit const none{0, 0};
@@ -136,9 +136,9 @@ TEST(TChildProcessTest, ASignalDisturbsNothing) {
   ::_exit(5);
 }
 
-TEST(TChildProcessTest, WhereNoneCanBeMadeNothingIsLeftOpen) {
+TEST(TChildProcessTest, WhenNoProcessCanBeCreatedNoDescriptorIsLeftOpen) {
   pid_t const child = ::fork();
-  if (child == 0) MakeOneTooMany();
+  if (child == 0) ExceedTheProcessLimit();
   int status = -1;
   ::waitpid(child, &status, 0);
   EXPECT_TRUE(WIFEXITED(status));

@@ -31,7 +31,7 @@ TEST(WriteWholeTest, ContinuesAfterASignal) {
   sigset_t alarm, unblocked;
   ::sigemptyset(&alarm);
   ::sigaddset(&alarm, SIGALRM);
-  ::pthread_sigmask(SIG_BLOCK, &alarm, &unblocked);  // the reader is not the one to be interrupted
+  ::pthread_sigmask(SIG_BLOCK, &alarm, &unblocked);  // the signals must interrupt the writer, not the reader
   std::thread reader([&] {
     while (signals < 2 && !isOver) ::usleep(1000);
     char chunk[4096];
@@ -53,7 +53,7 @@ TEST(WriteWholeTest, ContinuesAfterASignal) {
 
 TEST(WriteWholeTest, LeavesTheReasonOfAFailureInErrno) {
   TUniqueFd const full(::open("/dev/full", O_WRONLY));
-  NEEDS(full, "no /dev/full");
+  NEEDS(full, "/dev/full is missing");
   EXPECT_TRUE(WriteWhole(full.get(), ""));
   EXPECT_FALSE(WriteWhole(full.get(), "text"));
   EXPECT_EQ(errno, ENOSPC);

@@ -11,7 +11,7 @@
 namespace NQRVZEP20::zep {
 namespace {
 
-// A directory whose program "ps" prints a line that starts with the text and ends differently each time.
+// Puts a program "ps" on PATH, which prints a line that starts with `beginning` and ends differently each time.
 class TChangingLine {
 public:
   explicit TChangingLine(std::string const& beginning) : fPath(std::getenv("PATH")) {
@@ -33,11 +33,11 @@ TEST(DhcpClientsTest, OnlyAPlainProcessNumberIsAccepted) {
                   .find(" is wrong: " + number + " is not the number of a process. Nothing was ended."),
               std::string::npos)
         << number;
-  EXPECT_EQ(WhyNotToBeEnded({"dhclient without a number"}), "") << "ends nothing";
+  EXPECT_EQ(WhyNotToBeEnded({"dhclient without a number"}), "") << "a line without a number ends no process";
 }
 
 TEST(DhcpClientsTest, LinesAreComparedByTheirNumber) {
-  TChangingLine const line("9999999");  // which no process can have
+  TChangingLine const line("9999999");  // no process can have this number
   std::vector<std::string> const lines = DhcpClientLines();
   ASSERT_EQ(lines.size(), 1u);
   ASSERT_NE(lines, DhcpClientLines());
