@@ -7,7 +7,7 @@
 namespace NQRVZEP20 {
 
 // A T that is made with this object and never destroyed: for a static object that code may still use while other static
-// objects are destroyed. It lies in place, so that a leak checker finds all that it owns.
+// objects are destroyed. It is stored in place, so that a leak checker finds everything that it owns.
 //
 //   static TNeverDestroyed<TCache> cache;
 //   cache->Clear();

@@ -9,7 +9,7 @@
 
 namespace NQRVZEP20 {
 
-// Where a library is looked for: the names in the order in which they are tried, and the mode of dlopen.
+// The search for a library: the names, in the order in which they are tried, and the mode of dlopen.
 struct TLibraryPlace {
   std::vector<std::string> fNames;
   int fMode;
@@ -55,7 +55,7 @@ private:
 // null otherwise. `outcome` receives the result.
 TSharedLibrary OpenLibrary(TLibraryPlace const& place, std::vector<TLibraryFunction> const& table, TLoadOutcome& outcome);
 
-// The status that stands for the outcome in a log line.
+// The status that represents the outcome in a log line.
 EZEPStatusCode StatusOf(TLoadOutcome const& outcome);
 
 // A library opened at run time, and its functions. The library is closed with the object.

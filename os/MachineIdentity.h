@@ -8,7 +8,7 @@
 
 namespace NQRVZEP20 {
 
-// The identity of a machine, from SMBIOS type 1. Each field starts as the text that stands for an unreadable one.
+// The identity of a machine, from SMBIOS type 1. Each field starts as the text for an unreadable value.
 struct TMachineIdentity {
   std::string type = "0000";
   std::string name = "Unknown";

@@ -113,7 +113,7 @@ std::optional<TScsiAddress> AskGeneric(int fd) {
   return TScsiAddress{id.host_no, id.channel, id.scsi_id, id.lun};
 }
 
-// Returns nothing, with the reason in the log, when there is no answer.
+// Returns nothing, with the reason in the log, when the device does not answer.
 template <class TAsk>
 std::optional<TScsiAddress> AddressOfNode(std::string const& node, TAsk ask) {
   TUniqueFd const fd(::open(node.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));

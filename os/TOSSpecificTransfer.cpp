@@ -127,7 +127,7 @@ unsigned long curl_fwrite(void* data, unsigned long size, unsigned long count, v
 }
 
 void TOSSpecific::CurlTransferFile(std::string url, std::string localFile, bool download) {
-  TUniqueFile stream;  // of an upload; open until libcurl is gone
+  TUniqueFile stream;  // the file of an upload, open until libcurl is closed
   TCurl curl(kTransferMessages);
   curl.Set(CURLOPT_FTP_USE_EPSV, 0L, "TOSSpecific|CurlTransferFile: Error configuring curl passive mode");
   curl.Set(CURLOPT_PROXY, "", "TOSSpecific|CurlTransferFile: Error configuring curl proxy server");

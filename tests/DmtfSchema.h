@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// The DMTF CIM schema 2.49.0, which tests read if they find it. It is not ours to hand out: the environment variable
-// ZEP_DMTF_SCHEMA names the folder with its archive, or it lies in shared/data/dmtf-schema beside the source tree.
+// The DMTF CIM schema 2.49.0, which tests use when it is present. The project does not distribute it. The environment variable
+// ZEP_DMTF_SCHEMA names the folder with its archive; the default is shared/data/dmtf-schema beside the source tree.
 
 #include "tests/Support.h"
 
@@ -13,7 +13,7 @@ namespace NQRVZEP20 {
 constexpr char kDmtfArchive[] = "cim_schema_2.49.0Final-MOFs.zip";
 constexpr char kNoDmtfSchema[] = "the DMTF CIM schema 2.49.0 (ZEP_DMTF_SCHEMA)";
 
-// The path of the archive; empty when it is not there.
+// The path of the archive; empty when it is missing.
 inline std::string DmtfArchive() {
   namespace fs = std::filesystem;
   std::vector<fs::path> folders;
@@ -25,7 +25,7 @@ inline std::string DmtfArchive() {
   return "";
 }
 
-// The schema, unpacked into a folder of its own.
+// The schema, unpacked into a temporary folder.
 class TDmtfSchema {
 public:
   TDmtfSchema() {

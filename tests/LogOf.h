@@ -5,7 +5,7 @@
 
 namespace NQRVZEP20 {
 
-// Everything that the function logs, on a thread of its own: "[Debug] SpawnProcess: process ls".
+// Runs the function on a new thread and returns its log entries: "[Debug] SpawnProcess: process ls".
 template <class TFunction>
 std::vector<std::string> LogOf(TFunction function) {
   std::vector<std::string> entries;

@@ -18,7 +18,8 @@ namespace NQRVZEP20 {
 
 namespace {
 
-// Whatever the caller's settings are: other users reach what tests make, tools speak English, loopback needs no proxy.
+// Makes the tests independent of the caller's settings: other users can read files that tests create, tools print English, and
+// the variable no_proxy has no effect.
 [[maybe_unused]] mode_t const gCallersUmask = ::umask(022);
 [[maybe_unused]] bool const gIsPlain =
     ::setenv("LC_ALL", "C", 1) == 0 && ::unsetenv("no_proxy") == 0 && ::unsetenv("NO_PROXY") == 0;
@@ -84,7 +85,7 @@ TLogCapture::~TLogCapture() { TLogger::SetLogThreshold(fOldThreshold); }
 
 namespace {
 
-// The number of characters at the front of `text` that are digits or stand in `others`.
+// The number of characters at the start of `text` that are digits or in `others`.
 std::size_t LengthOf(std::string_view text, std::string_view others) {
   std::size_t length = 0;
   while (length < text.size() &&

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// What the tests of every room share.
+// Helpers that the tests of all rooms share.
 
 #include "ILogger.h"
 #include "TLogger.h"
@@ -38,7 +38,7 @@ namespace NQRVZEP20 {
       },                                                                          \
       ::NQRVZEP20::TZEPException)
 
-// Skips the test, saying why, when what it needs is not there; with CI=true it fails instead.
+// Skips the test, with the reason, when the condition is false; with CI=true it fails instead.
 #define NEEDS(condition, reason)                                                        \
   do {                                                                                  \
     if (!(condition)) {                                                                 \
@@ -109,7 +109,7 @@ public:
   TLogCapture(TLogCapture const&) = delete;
   TLogCapture& operator=(TLogCapture const&) = delete;
 
-  // What was written so far, without times: "[Debug] getMachineType() entered.". A message of several lines is one element.
+  // The entries written so far, without times: "[Debug] getMachineType() entered.". A message of several lines is one element.
   std::vector<std::string> Entries() const;
 
 private:
@@ -117,7 +117,7 @@ private:
   ILogger::EZEPLogSeverity fOldThreshold;
 };
 
-// Runs the function on a thread of its own, which has a fresh logger that ends with it.
+// Runs the function on a new thread, which has its own logger, and waits for it.
 void OnNewThread(std::function<void()> const& function);
 
 }  // namespace NQRVZEP20

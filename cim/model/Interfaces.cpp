@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// The destructors of the interfaces stand here, so that each interface's virtual table is made once, in this library; and
-// the bodies of the operations that a plug-in may leave out.
+// The destructors of the interfaces, which are defined here so that each interface's virtual table is emitted once, in this
+// library; and the default bodies of the operations that a plug-in may leave out.
 
 #include "ICIMClass.h"
 #include "ICIMElement.h"
@@ -41,7 +41,7 @@ INamespaceConsumer::~INamespaceConsumer() = default;
 INamespaceProvider::~INamespaceProvider() = default;
 INamespaceProviderManager::~INamespaceProviderManager() = default;
 
-// ---- What a plug-in may leave out ----
+// ---- Default bodies, for operations that a plug-in may leave out ----
 
 namespace {
 

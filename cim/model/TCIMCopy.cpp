@@ -38,7 +38,7 @@ void EndDeclarationsQuietly(ICIMClass& cls) noexcept {
   }
 }
 
-// The class is told that it is being described, also of the end when that comes by an exception.
+// Calls BeginDeclarations and EndDeclarations on the class; the latter also when an exception ends the copy.
 void CopyPropertyDecls(ICIMClass const& cls, boost::shared_ptr<ICIMClass> copy, boost::shared_ptr<ICIMNamespace> dst) {
   copy->BeginDeclarations(TCIMContext());
   try {

@@ -31,7 +31,7 @@ constexpr char kProductClassName[] = "QRVSG_ZEPProduct";
 constexpr char kPluginNameQualifier[] = "PLUGINNAME";
 constexpr char kOverrideQualifier[] = "OVERRIDE";
 
-// Empty when the namespace is gone; its use is a failed assertion then.
+// Empty when the namespace no longer exists; using the result is then a failed assertion.
 boost::shared_ptr<ICIMNamespace> Lock(boost::weak_ptr<ICIMNamespace> const& destination) {
   try {
     return boost::shared_ptr<ICIMNamespace>(destination);
@@ -47,7 +47,7 @@ void CopyQualifiers(ICIMNamedElement const& from, boost::weak_ptr<ICIMNamespace>
   from.EnumerateQualifiers(boost::ref(copyQualifier), TCIMContext());
 }
 
-// A declaration without a default may leave the type to be told by the declaration itself.
+// The default of a declaration; a declaration without a default may omit the default's type, which is then `type`.
 TCIMValue TypedDefault(TCIMValue::TCIMType type, TCIMValue defaultValue) {
   if (defaultValue.GetType() == TCIMValue::TCIMType::kCIMTypeInvalid) defaultValue.SetNullValue(type, 0);
   return defaultValue;
@@ -135,7 +135,7 @@ bool TCopyPropertyDecl::operator()(boost::shared_ptr<ICIMPropertyDecl> declarati
 void TCopyPropertyDecl::Copy(ICIMPropertyDecl const& declaration) {
   TCIMContext const none;
   std::string const name = declaration.GetName(none);
-  // What these two find changes nothing, but a declaration for which one of them throws is left out. Kept.
+  // The results are not used, but a declaration for which one of these calls throws is left out. Kept.
   fTarget->GetPropertyDecl(name, none);
   declaration.GetQualifier(kOverrideQualifier, none);
 

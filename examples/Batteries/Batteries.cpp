@@ -19,7 +19,7 @@ using namespace NQRVZEP20;
 
 namespace {
 
-// Where the kernel shows the batteries. EXAMPLE_BATTERIES names another directory, for tests.
+// The directory in which the kernel lists the batteries. EXAMPLE_BATTERIES names another one, for tests.
 std::filesystem::path Directory() {
   char const* const named = std::getenv("EXAMPLE_BATTERIES");
   return named != nullptr ? named : "/sys/class/power_supply";

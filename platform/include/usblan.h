@@ -28,8 +28,8 @@ int QueryOvdLanState(int node);
 
 /*
  * Brings up the interface of the node and gives it the address 169.254.(95 + n).1/24, unless it already has one from which
- * the controller is reached. Other addresses stay. Returns 0, or an errno value: ENODEV when there is no such node or its
- * interface is missing, EPERM without the right to configure it.
+ * the controller is reached. Other addresses are kept. Returns 0, or an errno value: ENODEV when the node does not exist or its
+ * interface is missing, EPERM without the permission to configure it.
  */
 int BringupOvdLan(int node);
 

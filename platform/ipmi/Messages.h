@@ -46,7 +46,8 @@ public:
   // The number by which the controller identifies the session.
   virtual std::uint32_t SessionId() const = 0;
 
-  // Later, packets of the session up to this reply's no longer count as answers: they may be copies.
+  // Stores the reply's packet number. Packets of the session up to this number are no longer accepted as answers: they may be
+  // copies.
   void Accept(TReply const& reply) { fNewest = reply.packet; }
 
 protected:

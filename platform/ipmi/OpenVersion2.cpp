@@ -24,7 +24,7 @@ unsigned DigestSize(TCipherSuite const& suite) {
   return isSha256 ? IPMI_HMAC_SHA256_DIGEST_LENGTH : IPMI_HMAC_SHA1_DIGEST_LENGTH;
 }
 
-// The failure that the status in a controller's answer stands for. `otherwise`: the cause for every other status.
+// Throws the failure that the status in a controller's answer means. `otherwise`: the cause for all statuses not listed here.
 void CheckStatus(unsigned status, TFailure::ECause otherwise) {
   switch (status) {
     case RMCPPLUS_STATUS_NO_ERRORS:
@@ -112,7 +112,8 @@ EVerdict TOpening2::VerdictOn(TPacket const& packet, unsigned char type, TFields
 }
 
 void TOpening2::AskForSession() {
-  // Some controllers refuse a session when a privilege is named. A privilege that the account lacks is found out later.
+  // Some controllers refuse a session when the request names a privilege. Without it, a missing privilege of the account is
+  // detected in a later step.
   unsigned char const privilege = fWay.namesPrivilege ? kPrivilege : IPMI_PRIVILEGE_LEVEL_HIGHEST_LEVEL;
   TFields request(tmpl_rmcpplus_open_session_request);
   Checked(::fill_rmcpplus_open_session(++fTag, privilege, fOwnId, fSuite.authentication, fSuite.integrity, fSuite.confidentiality,

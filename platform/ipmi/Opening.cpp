@@ -38,7 +38,7 @@ TContact MakeContact(TLink& link, TWaits const& waits, TClock::time_point deadli
   TFields request(tmpl_cmd_get_channel_authentication_capabilities_rq);
   Checked(::fill_cmd_get_channel_authentication_capabilities(IPMI_CHANNEL_NUMBER_CURRENT_CHANNEL, IPMI_PRIVILEGE_LEVEL_ADMIN,
                                                              IPMI_GET_IPMI_V20_EXTENDED_DATA, request.Object()));
-  // The query changes nothing, so each sending has a number of its own, which shows the one that was answered.
+  // The query changes nothing on the controller, so each repetition gets its own number, which identifies the one answered.
   TMessage message = MessageOf(IPMI_NET_FN_APP_RQ, 0, request);
   TEnvelope15 envelope;
   std::map<unsigned char, TClock::time_point> sent;

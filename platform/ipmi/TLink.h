@@ -73,8 +73,8 @@ struct TExchange {
   std::function<EVerdict(TPacket const&)> judge;
 };
 
-// Sends the request until `judge` finds its answer; other packets are skipped. Throws TFailure when there is no answer in time:
-// kIpmiClientNoAnswer, or kIpmiClientFail if nonsense was received.
+// Sends the request repeatedly until `judge` recognises its answer; other packets are skipped. Throws TFailure when no answer
+// arrives in time: kIpmiClientNoAnswer, or kIpmiClientFail when invalid packets were received.
 void Exchange(TLink& link, TExchange const& exchange, TWaits const& waits, TClock::time_point deadline);
 
 }  // namespace ipmi

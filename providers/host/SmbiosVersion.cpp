@@ -39,7 +39,7 @@ TSmbiosVersion Corrected(TSmbiosVersion version) {
   return version;
 }
 
-// The start of a file. Empty when there is no such file, or when it is not a regular one: reading a pipe could block.
+// The start of a file. Empty when the file does not exist or is not a regular file: reading a pipe could block.
 TFinding<std::string> StartOf(std::filesystem::path const& path) {
   std::error_code ignored;
   if (!std::filesystem::is_regular_file(path, ignored)) return std::string();

@@ -21,7 +21,7 @@ struct TOutcome {
   bool fired;
 };
 
-// Does one operation in a directory of its own, with a fault (FUNCTION:NUMBER:ERRNO) or without one.
+// Runs one operation in a private directory, with a fault (FUNCTION:NUMBER:ERRNO) or without one.
 TOutcome Do(std::string const& operation, std::string const& fault = "") {
   TTempDir const dir;
   WriteFile(dir.Path("small"), "0123456789");

@@ -100,15 +100,15 @@ TEST(MachineIdentityTest, DamagedStructuresNameNoString) {
       {"two bytes", "\1\6", "none"},
       {"formatted length 0", "\1\0\0\0\0\1one\0\0"s, "none"},
       {"formatted length past the end", "\1\xFF\0\0\0\1one\0\0"s, "none"},
-      {"a formatted area that ends in front of the byte", "\1\5\0\0\0\1one\0\0"s, "none"},
+      {"a formatted area that ends before the byte", "\1\5\0\0\0\1one\0\0"s, "none"},
       {"no string set", "\1\6\0\0\0\1"s, "none"},
-      {"a string that nothing ends", "\1\6\0\0\0\1one"s, "none"},
+      {"a string without an end", "\1\6\0\0\0\1one"s, "none"},
       {"a string and one zero", "\1\6\0\0\0\1one\0"s, "none"},
       {"an empty set", "\1\6\0\0\0\1\0\0"s, "none"},
-      {"an empty set and zeros behind it", "\1\6\0\0\0\2\0\0\0\0"s, "none"},
-      {"a number behind the set, and zeros there", "\1\6\0\0\0\2one\0\0\0"s, "none"},
-      {"a number behind the set, and more zeros there", "\1\6\0\0\0\3one\0\0\0\0\0\0"s, "none"},
-      {"a number behind the set, and another text there", "\1\6\0\0\0\3one\0\0two\0\0"s, "none"},
+      {"an empty set, followed by zeros", "\1\6\0\0\0\2\0\0\0\0"s, "none"},
+      {"a number after the set, followed by zeros", "\1\6\0\0\0\2one\0\0\0"s, "none"},
+      {"a number after the set, followed by more zeros", "\1\6\0\0\0\3one\0\0\0\0\0\0"s, "none"},
+      {"a number after the set, followed by another text", "\1\6\0\0\0\3one\0\0two\0\0"s, "none"},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);

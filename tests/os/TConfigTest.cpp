@@ -23,7 +23,7 @@ TSettings SettingsOf(TConfig& config) {
   return settings;
 }
 
-// In a working directory of its own. Only child processes use the instance of the process.
+// Runs in a private working directory. Only child processes use the instance of the process.
 class TConfigTest : public testing::Test {
 protected:
   TConfigTest() : fDirectory(fDir.Path()) {}
@@ -205,7 +205,7 @@ TEST_F(TConfigTest, DestroyingAnotherDestroysTheInstanceAndKeepsItsAddress) {
 }
 
 TEST_F(TConfigTest, DestroyingAnotherFreesTheInstance) {
-  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, whose allocator does not tell how much is in use";
+  if (kIsSanitized) GTEST_SKIP() << "the allocator of a sanitizer does not report how much memory is in use";
   EXPECT_EQ(InChild([] {
               WriteFile("zep.cfg", "a=" + std::string(100000, 'x'));
               TConfig::GetInstance();

@@ -520,8 +520,8 @@ TEST_F(TLoggerTest, TheTimeHasNoZeroFillAndNoFixedWidth) {
   }
 }
 
-// The same six readings tell a line written across the turn of a second, an hour or a year.
-TEST_F(TLoggerTest, EachFieldOfTheTimeIsAReadingOfItsOwn) {
+// Each field of a time is read separately, so a line written at the turn of a second, an hour or a year may mix two times.
+TEST_F(TLoggerTest, EachFieldOfTheTimeIsReadSeparately) {
   TLogger::SetLogThreshold(ILogger::kLogDebug);
   TLogger logger;
   logger.SetLogFilename(Path("a.log"));

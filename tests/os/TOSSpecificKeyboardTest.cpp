@@ -71,7 +71,7 @@ TEST_F(KeyboardTest, AKeyWaitsOnceItIsTyped) {
   EXPECT_FALSE(TOSSpecific::IsKeyWaiting());
   Type("a");
   EXPECT_TRUE(TOSSpecific::IsKeyWaiting());
-  EXPECT_TRUE(TOSSpecific::IsKeyWaiting());  // asking does not take it
+  EXPECT_TRUE(TOSSpecific::IsKeyWaiting());  // the query does not consume the key
   EXPECT_EQ(TOSSpecific::GetKeyboardChar(), 'a');
   EXPECT_FALSE(TOSSpecific::IsKeyWaiting());
 }

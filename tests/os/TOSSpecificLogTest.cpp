@@ -277,7 +277,7 @@ TEST_F(SetDebugLevelTest, AGivenPathIsUsedInBothVariants) {
   EXPECT_TRUE(std::filesystem::exists(fDir.Path("zep_000020240303-090507.log")));
 }
 
-// Without a path the file lies in a directory of the system. Tests do not write there: they look at a tree of their own.
+// Without a path, the file is created in a system directory. The tests do not write there; they use a private directory.
 TEST_F(SetDebugLevelTest, WithoutAPathTheVariantNamesTheDirectory) {
   NEEDS(::geteuid() == 0, "root, for a mount namespace");
   for (bool isOEM : {false, true}) {

@@ -84,7 +84,7 @@ TEST_F(TOSSpecificMachineTest, HostileTablesGiveTheDefaults) {
       {"noise", std::string(65536, '\xA5')},
       {"zeros", std::string(65536, '\0')},
       {"no type 0 or 1", Structure(3, "") + EndOfTable()},
-      {"types 0 and 1 behind the end", EndOfTable() + full},
+      {"types 0 and 1 after the end", EndOfTable() + full},
       {"types 0 and 1 without fields", Structure(0, "") + Structure(1, "") + EndOfTable()},
       {"string numbers 0", Structure(0, "\0\0"s, {"AB"}) + Structure(1, "\0\0\0\0"s, {"1234AB7"})},
       {"string numbers past the set", Structure(0, "\0\2"s, {"AB"}) + Structure(1, "\0\2\0\3"s, {"1234AB7"})},
@@ -128,7 +128,7 @@ TEST_F(TOSSpecificMachineTest, AStructureOfMoreThan1024BytesIsReadUpToThere) {
     std::string const product = "1234AB7";
     UseTable(Structure(1, fields, {std::string(room - product.size() - spare - 2, 'x'), product, "KQ12345"}));
     EXPECT_EQ(TOSSpecific::GetMachineType(), "1234");
-    EXPECT_EQ(TOSSpecific::GetMachineSN(), "Unknown") << "it lies behind the buffer";
+    EXPECT_EQ(TOSSpecific::GetMachineSN(), "Unknown") << "the string is after the end of the buffer";
   }
 }
 
@@ -317,8 +317,8 @@ TEST(GetBIDStringTest, CopiesTheStringOfThatNumber) {
       {"a later number, with its zero", two, 11, 2, "1 three\0"s + std::string(10, '#')},
       {"number 3 of two", two, 11, 3, "0 " + nothing},
       {"number 3 of two, without the closing zero", two, 10, 3, "0 " + nothing},
-      {"number 3 of two, zeros behind", two + std::string(80, '\0'), 91, 3, "0 " + nothing},
-      {"number 4 of two, zeros behind", two + std::string(80, '\0'), 91, 4, "0 " + nothing},
+      {"number 3 of two, zeros after them", two + std::string(80, '\0'), 91, 3, "0 " + nothing},
+      {"number 4 of two, zeros after them", two + std::string(80, '\0'), 91, 4, "0 " + nothing},
       {"number 0", two, 11, 0, "0 " + nothing},
       {"a negative number", two, 11, -1, "0 " + nothing},
       {"length 0", two, 0, 1, "0 " + nothing},
@@ -329,7 +329,7 @@ TEST(GetBIDStringTest, CopiesTheStringOfThatNumber) {
       {"a length that just holds the first string", two, 4, 1, "1 one" + std::string(13, '#')},
       {"an empty set", "\0\0"s, 2, 1, "0 " + nothing},
       {"an empty string between others", "a\0\0b\0\0"s, 6, 2, "1 \0"s + std::string(15, '#')},
-      {"a string behind an empty one", "a\0\0b\0\0"s, 6, 3, "1 b\0"s + std::string(14, '#')},
+      {"a string after an empty one", "a\0\0b\0\0"s, 6, 3, "1 b\0"s + std::string(14, '#')},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);

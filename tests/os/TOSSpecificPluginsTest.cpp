@@ -361,7 +361,7 @@ TEST_F(RootPathTest, TheFactorysNameBeginsWithTheRequestedBaseName) {
                           "the library is loaded"));
 }
 
-// The second library needs a function of the first: it is refused at once while that is missing, and finds it later.
+// The second library needs a function of the first: it is refused while that is missing, and loaded later.
 TEST_F(RootPathTest, APluginIsResolvedAtOnceAndSeenByThoseLoadedLater) {
   std::string const user = kPlugins + "libDiskUser.pi.so";
   EXPECT_THAT(Probe("load-plugins " + user + " " + kPlugins + "libDisk.pi.so " + user),

@@ -518,7 +518,7 @@ TEST_F(SpawnProcessTest, AReadEndThatSelectCannotWatchIsAFailureOfSelectAndNothi
 }
 
 TEST_F(SpawnProcessTest, WithoutDescriptorsForAPipeItIsMinusOneAndLogged) {
-  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs descriptors of its own";
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer needs additional descriptors";
   TEntries const entries = LogOf([] {
     int const lowest = ::dup(0);
     ::close(lowest);
@@ -648,7 +648,7 @@ void OnStackOf(std::size_t size, std::function<void()> function) {
 }
 
 TEST_F(SpawnProcessTest, AStackOf32KiBIsEnough) {
-  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs stack of its own";
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer needs additional stack";
   constexpr std::size_t kLength = 1000000;
   TTempDir const dir;
   TRun searched, withEnvironment;

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// File transfer with a stand-in for libcurl (tests/os/curl): which options are set, in which order and to what, and what
-// becomes of each failure. Real servers: tests/system/transfer.
+// Tests file transfer with a stand-in for libcurl (tests/os/curl): the options, their order and values, and the result of each
+// failure. tests/system/transfer tests it with real servers.
 
 #include "os/ProxyCheck.h"
 #include "tests/os/HostTools.h"
@@ -24,7 +24,7 @@ using testing::IsEmpty;
 using testing::StartsWith;
 using TLines = std::vector<std::string>;
 
-// While it lives, "libcurl.so" is the stand-in.
+// Makes the stand-in the library "libcurl.so" until it is destroyed.
 class TStandIn {
 public:
   explicit TStandIn(TCurlRecord& record, std::string const& variant = "whole")

@@ -53,7 +53,7 @@ struct TFree {
 };
 using TMessage = std::unique_ptr<unsigned char, TFree>;
 
-// Runs the step on a thread of its own and returns the lines that it logged.
+// Runs the step on a new thread and returns the lines that it logged.
 TEntries LogOf(std::function<void()> const& step) {
   TEntries entries;
   OnNewThread([&] {
@@ -264,7 +264,7 @@ TEST(AutoProxyDiscoveryTest, TheSendSocketIsAUdpSocketThatMayBroadcast) {
 }
 
 TEST(AutoProxyDiscoveryTest, WithoutDescriptorsOpeningASocketFailsWithALogLine) {
-  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs descriptors of its own";
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer needs additional descriptors";
   int sender = 0, receiver = 0;
   EXPECT_EQ(LogOf([&] {
               TNoMoreDescriptors const none;
@@ -300,7 +300,7 @@ TEST(AutoProxyDiscoveryTest, TheTimeoutAppliesToReceiving) {
 // Runs the test in a network namespace that has only a loopback interface.
 void InOwnNetwork(std::function<void()> const& test) {
   OnNewThread([&] {
-    if (::unshare(CLONE_NEWNET) != 0) FAIL() << "no network of its own: " << std::strerror(errno);
+    if (::unshare(CLONE_NEWNET) != 0) FAIL() << "no network namespace can be created: " << std::strerror(errno);
     test();
   });
 }

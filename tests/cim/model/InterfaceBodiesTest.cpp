@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// What a plug-in may leave out of an implementation of the interfaces.
+// Tests the default bodies of the operations that a plug-in may leave out.
 
 #include "Fakes.h"
 #include "ICIMParameterDecl.h"
@@ -43,7 +43,7 @@ public:
   unsigned int GetFlavor(TCIMContext const&) const override { return 0; }
 };
 
-TEST(InterfaceBodiesTest, WhatNeedsAnAnswerIsNotImplemented) {
+TEST(InterfaceBodiesTest, OperationsThatNeedAResultThrowNotImplemented) {
   TCIMContext const none;
   auto const ns = boost::make_shared<TFakeNamespace>();
   TFakeInstance const instance;

@@ -21,7 +21,7 @@ namespace {
 
 using TSlots = std::vector<std::size_t>;
 
-// Whether the slots are ascending and after the two destructors.
+// Whether the slots are in ascending order and come after those of the two destructors.
 bool AreInOrder(TSlots const& slots) { return slots.front() >= 3 && std::is_sorted(slots.begin(), slots.end()); }
 
 TEST(InterfaceSlotsTest, OperationsKeepTheirOrder) {

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// The table of docs/writing-a-provider.md that says which operations each use needs: a model that has just those is enough,
-// each of them is called, and one that is left out is named in the log.
+// Tests the table of docs/writing-a-provider.md, which lists the operations that each use needs: a model with only those
+// operations is sufficient, each of them is called, and the log names one that is left out.
 
 #include "TCIMCopy.h"
 #include "TCIMSchemaHelper.h"
@@ -18,7 +18,7 @@ using testing::HasSubstr;
 
 enum EUse { kCopyFrom = 1, kCopyInto, kQueries, kReferences };
 
-// What the documented table says of all uses.
+// The contents of the documented table.
 struct TDocumented {
   std::map<EUse, std::set<std::string>> fOperations;  // "ICIMClass::GetName"
   std::map<EUse, std::set<std::string>> fWithBody;    // those that may be left out

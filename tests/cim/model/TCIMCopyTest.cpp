@@ -115,7 +115,7 @@ TEST_F(TCIMCopyTest, AQualifierThatTheDestinationDeclaresAlreadyEndsTheCopy) {
   EXPECT_THAT(ClassNames(*fCopy), IsEmpty());
 }
 
-TEST_F(TCIMCopyTest, AFailureEndsTheCopyAndLeavesWhatWasMade) {
+TEST_F(TCIMCopyTest, AFailureEndsTheCopyAndKeepsTheObjectsMadeSoFar) {
   fSource->DefineClass("X_A").Property("Name", "string");
   fSource->DefineClass("X_B")
       .Property("Name", "string")
@@ -256,7 +256,7 @@ TEST_F(TCIMCopyTest, AnyEmptyAnswerOfTheDestinationIsNotFoundBeforeAnythingElseI
   }
 }
 
-TEST_F(TCIMCopyTest, ReasonNamesWhatTheDestinationDidNotReturn) {
+TEST_F(TCIMCopyTest, TheReasonNamesTheObjectThatTheDestinationDidNotReturn) {
   std::pair<char const*, char const*> const rows[] = {
       {"CreateClass dst:X_B under X_A", "the destination returned no class X_B"},
       {"GetQualifierDecl dst:Description", "the destination returned no qualifier declaration Description"},
@@ -308,7 +308,7 @@ TEST_F(TCIMCopyTest, AQualifierThatTheDestinationDoesNotDeclareEndsTheCopyOfACla
   EXPECT_THAT(Names(*fCopy->GetClass("X_A", kNone), &ICIMClass::EnumeratePropertyDecls), IsEmpty());
 }
 
-TEST_F(TCIMCopyTest, AnUndeclaredQualifierIsNotAskedFor) {
+TEST_F(TCIMCopyTest, AnUndeclaredQualifierIsNotRequested) {
   fSource->DefineClass("X_A").Description("a");
   EXPECT_STATUS(TCIMCopy::CopyClass(fSource->GetClass("X_A", kNone), Traced(fCopy, "dst")), kZEPStatusNotFound);
   EXPECT_THAT(fTrace.fCalls, ElementsAre("CreateClass dst:X_A", "GetQualifierDecl dst:Description"));
@@ -425,7 +425,7 @@ TEST_F(TCIMCopyTest, ADeclarationThatRefersToAClassThatIsNotThereYetIsSkipped) {
   EXPECT_FALSE(Decl(*fCopy, "X_Early", "Late"));
 }
 
-TEST_F(TCIMCopyTest, OtherExceptionsOfADeclarationPassThroughAndTheClassIsToldOfTheEnd) {
+TEST_F(TCIMCopyTest, OtherExceptionsOfADeclarationPassThroughAfterEndDeclarations) {
   fSource->DefineClass("X_A").Property("Bad", "string");
   fTrace.fOnCall["AddPropertyDecl dst:X_A.Bad"] = [] { throw std::runtime_error("no memory"); };
   EXPECT_THROW(CopyTraced(), std::runtime_error);
@@ -449,7 +449,7 @@ TEST_F(TCIMCopyTest, AStaticPropertyIsCopiedWithItsValue) {
   }
 }
 
-// ---- A destination that is gone ----
+// ---- A destination that no longer exists ----
 
 TEST_F(TCIMCopyTest, AStepGoesOnWithoutItsNamespace) {
   auto const cls =
@@ -464,7 +464,7 @@ TEST_F(TCIMCopyTest, AStepGoesOnWithoutItsNamespace) {
   OnNewThread([&] {
     TLogCapture const log;
     for (auto const& decl : All(*cls, &ICIMClass::EnumeratePropertyDecls)) EXPECT_TRUE(copyDeclaration(decl));
-    // What needs no namespace is done all the same; a qualifier needs it. GetPropertyDecl throws for an unknown name here.
+    // Only a qualifier needs the namespace; everything else is copied. GetPropertyDecl throws for an unknown name here.
     EXPECT_THAT(log.Entries(), ElementsAre(kLine, kLine));
   });
   target->BeginDeclarations(kNone);
@@ -696,8 +696,8 @@ TEST_F(ProductCopyTest, AnInstanceOfAnyClassCanBeCopiedByItself) {
 
 // ---- Values ----
 
-TEST_F(TCIMCopyTest, AValueThatIsNoReferenceComesBackAsItIs) {
-  boost::shared_ptr<ICIMNamespace> const none;  // it is not asked for
+TEST_F(TCIMCopyTest, AValueThatIsNotAReferenceIsReturnedUnchanged) {
+  boost::shared_ptr<ICIMNamespace> const none;  // it is not needed
   for (TCIMValue const& value :
        {TCIMValue(), TCIMValue(true), TCIMValue(5u), TCIMValue("a\"b"), TCIMValue(1.5), NullOf("string[4]"), NullOf("uint8"),
         NullOf("reference[3]"), TCIMValue(TType::kCIMTypeString, 2, {TCIMValue("x"), TCIMValue("y")})}) {
@@ -761,7 +761,7 @@ TEST_F(TCIMCopyTest, TheElementsOfAnArrayOfReferencesAreCopiedToo) {
 
 // ---- Threads ----
 
-// Several threads copy instances, each into a namespace of its own; the sanitizer sees what they share.
+// Several threads copy instances, each into its own namespace; the sanitizer detects races on shared data.
 TEST(CopyThreadsTest, ThreadsCopyInstancesAtOnce) {
   std::vector<std::thread> threads;
   std::atomic<int> copied{0};

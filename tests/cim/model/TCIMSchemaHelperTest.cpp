@@ -313,7 +313,7 @@ TEST_F(TCIMSchemaHelperTest, IsValidMTMChecksTheFirstSevenCharacters) {
 
 struct TProductNameRow {
   char const* productName;
-  char const* mtm;  // null: there is no MTM in the name
+  char const* mtm;  // null: the name contains no MTM
 };
 
 TEST_F(TCIMSchemaHelperTest, FindsTheMTMInAProductName) {
@@ -638,7 +638,7 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheOtherIdentifyingInfoIsTheTextAfterTheColonOf
   } const kRows[] = {
       {"two with a colon", Strings({"a:b:c", "d:e"}), "b:c"},
       {"blanks", Strings({"SN: KQ1234A "}), " KQ1234A "},
-      {"nothing behind the colon", Strings({"SN:"}), ""},
+      {"nothing after the colon", Strings({"SN:"}), ""},
       {"no colon", Strings({"a", "b"}), "Unknown"},
       {"no entry", Strings({}), "Unknown"},
       {"a NULL entry", withNull, "A"},

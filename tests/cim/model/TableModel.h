@@ -25,7 +25,7 @@ namespace NQRVZEP20 {
 struct TTable {
   std::set<std::string> fOperations;  // "ICIMClass::GetName"
   mutable std::set<std::string> fCalled;
-  mutable bool fIsChecked = true;  // false: every operation is there, and calls are not noted
+  mutable bool fIsChecked = true;  // false: every operation is available, and calls are not recorded
 
   bool Has(std::string const& operation) const {
     if (!fIsChecked) return true;
@@ -201,8 +201,8 @@ private:
   boost::shared_ptr<ICIMInstance> fInner;
 };
 
-// GetPropertyDecl answers a name that is not declared with an empty pointer, which saves the class the operations that tell
-// it when it is being described.
+// GetPropertyDecl returns an empty pointer for an undeclared name, so the class does not need BeginDeclarations and
+// EndDeclarations.
 class TTableClass : public TTableElement<ICIMClass> {
 public:
   TTableClass(TTable const& table, boost::shared_ptr<ICIMClass> inner) : TTableElement(table, "ICIMClass", inner) {}

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Ends at once, but its own child lives on, prints later and holds the output open until then.
+// Ends immediately, but its child continues to run, keeps the output open, and prints later.
 #include <unistd.h>
 
 int main() {

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Prints a chunk with a zero byte in it, and later, as a chunk of its own, one without.
+// Prints a chunk that contains a zero byte and, later, a separate chunk without one.
 #include <unistd.h>
 
 int main() {

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Prints a full stop, waits as many milliseconds as its first argument says, and so on as often as its second says.
+// Prints a full stop and waits for as many milliseconds as its first argument; repeats this as often as its second argument.
 #include <unistd.h>
 
 #include <cstdlib>

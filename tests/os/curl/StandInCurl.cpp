@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// A stand-in for libcurl: its six functions, which write down how they are called into the record of the test. Without a record
-// it prints the name of its own file.
+// A stand-in for libcurl. Its six functions record their calls in the test's record. Without a record it prints the name of its
+// own file.
 
 #include "tests/os/curl/StandInCurl.h"
 

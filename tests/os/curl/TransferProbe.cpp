@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Downloads twice with the library and the libcurl that it is led to, and tells what came of it.
+// Downloads twice, with the library and libcurl that the environment selects, and prints the results.
 //
-//   TransferProbe [FROM TO]      links TO to the file FROM between the two
+//   TransferProbe [FROM TO]      makes TO a link to the file FROM between the two downloads
 //   TransferProbe --proxy        checks a proxy instead
 
 #include "TOSSpecific.h"

@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// To be preloaded: makes one call of a named function of the C library fail. ZEP_FAULT says which, as FUNCTION:NUMBER:ERRNO,
-// the number counting the calls of that function from 1; "child." before the function means those of a child before its
-// exec. For write, the errors 0 and -1 stand for a write of nothing and of the first half; for select, the
-// error 0 stands for a time-out that was of 300 seconds.
+// A library to be preloaded. It makes one call of a function of the C library fail, which ZEP_FAULT names as
+// FUNCTION:NUMBER:ERRNO. The number counts the calls of that function from 1; with "child." before the function, it counts the
+// calls of a child before its exec. For write, the error 0 means that nothing is written and -1 that the first half is; for
+// select, the error 0 means a time-out of 300 seconds.
 //
-// Calls count from ArmFaults to DisarmFaults only, so that a program can prepare itself first. CallsOfFaults tells how
-// often each function was called in between.
+// Only calls between ArmFaults and DisarmFaults are counted, so that a program can prepare itself first. CallsOfFaults returns
+// the number of calls of each function in between.
 
 #include <dirent.h>
 #include <dlfcn.h>
@@ -32,7 +32,7 @@ namespace {
 
 constexpr int kFunctions = 64;
 
-// Shared with children, which count as well.
+// Shared with children, whose calls are counted as well.
 struct TState {
   struct {
     char name[32];
@@ -125,7 +125,7 @@ EXPORT int open(char const* path, int flags, ...) {
   return -1;
 }
 
-// Lets the read below fail, so that the stream has its error; the number in ZEP_FAULT counts for nothing.
+// Makes the underlying read fail, so that the stream has its error. The number in ZEP_FAULT is ignored.
 EXPORT size_t fread(void* buffer, size_t size, size_t count, FILE* stream) {
   static auto* const next = Next("fread", &fread);
   if (IsTheOne("fread")) {

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Does one operation of the host services while the preloaded tests/os/faults makes one of its calls fail, and prints what
-// came of it: the result, what was logged, what is left behind.
+// Runs one operation of the host services while the preloaded tests/os/faults makes one of its calls fail. Prints the result, the
+// log entries, and the resources that are left.
 //
 //   FaultyOperation OPERATION       in a directory of files that the test prepared
 
@@ -32,7 +32,7 @@ std::string Joined(std::vector<std::string> const& texts) {
   return all;
 }
 
-// What is prepared, what is called while faults count, and what is looked at afterwards.
+// The preparation, the call that is run while faults are armed, and the inspection after it.
 struct TOperation {
   std::function<std::string()> fCall;
   std::function<std::string()> fLook = [] { return ""; };

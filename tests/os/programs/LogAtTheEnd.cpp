@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Logs from three destructors at the end of the process, and says which ran: of a thread-local object while the main thread
-// still has its logger, of a static object once that logger is gone, and of a registered provider once the logger's own
-// statics are gone as well. Opens the log file that it is given.
+// Logs from three destructors at the end of the process and prints which of them ran: that of a thread-local object while the
+// main thread still has its logger, that of a static object after this logger is destroyed, and that of a registered provider
+// after the logger's statics are destroyed as well. The argument is the log file.
 
 #include "INamespaceProvider.h"
 #include "TLogger.h"

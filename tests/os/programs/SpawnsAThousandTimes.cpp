@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Runs one form of spawning a thousand times and prints what that left behind: descriptors, children, allocated bytes.
+// Runs one form of spawning a thousand times and prints the resources that are left: descriptors, children, allocated bytes.
 
 #include "TOSSpecific.h"
 #include "tests/os/HostTools.h"
@@ -59,7 +59,7 @@ std::size_t AllocatedBytes() { return ::mallinfo2().uordblks; }
 
 int main(int, char** arguments) {
   auto const& spawn = kForms.at(arguments[1]);
-  for (int i = 0; i < 10; ++i) spawn();  // until everything that stays is there
+  for (int i = 0; i < 10; ++i) spawn();  // makes all allocations that are kept
   OpenDescriptors();
   int const descriptors = OpenDescriptors();
   std::size_t const bytes = AllocatedBytes();

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Prints where the library lies, the host provider's class of the system, the exception for an empty
+// Prints the directory of the library, the host provider's class of the system, the exception for an empty
 // pointer, and the reason that a failure carries.
 
 #include <zepcore.h>

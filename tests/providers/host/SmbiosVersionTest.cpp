@@ -83,7 +83,7 @@ TEST_F(VersionOfTablesTest, TheEntryPointOfABareTableIsInItsDirectory) {
 }
 
 TEST_F(VersionOfTablesTest, AFileThatCannotBeOpenedIsTheReason) {
-  if (kIsSanitized) GTEST_SKIP() << "the sanitizer opens descriptors of its own";
+  if (kIsSanitized) GTEST_SKIP() << "the sanitizer opens additional descriptors";
   WriteFile(fDir.Path("DMI"), RealTable("full"));
   int const next = ::dup(STDIN_FILENO);
   ::close(next);

@@ -136,7 +136,7 @@ double MemoryPerByteOf(std::string const& text) {
 }
 
 TEST(DeepInheritanceTest, ASchemaTakesAtMostSevenAndAHalfTimesItsSizeInMemory) {
-  if (kIsSanitized) GTEST_SKIP() << "a sanitizer takes memory of its own";
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer uses additional memory";
   std::string text = kQualifiers;
   for (int at = 0; at < 5000; ++at) {
     std::string const number = std::to_string(at);
@@ -144,22 +144,21 @@ TEST(DeepInheritanceTest, ASchemaTakesAtMostSevenAndAHalfTimesItsSizeInMemory) {
             "class " + Name(at) + (at == 0 ? "" : " : " + Name((at - 1) / 3)) + " {\n";
     for (int p = 0; p < 8; ++p)
       text += "  [Description(\"Property " + std::to_string(p) + " of class " + number +
-              ", which says something about the part that nobody else says.\")]\n  string P" + number + "_" + std::to_string(p) +
-              ";\n";
+              ", which describes a detail of the part.\")]\n  string P" + number + "_" + std::to_string(p) + ";\n";
     text += "  [Description(\"Starts the part, after a delay in seconds.\")]\n  uint32 Start(uint32 Delay, string Name);\n};\n";
   }
   EXPECT_LT(MemoryPerByteOf(text), 7.5);
 }
 
 TEST(DeepInheritanceTest, EmptyClassesTakeAtMostTwentyFourTimesTheirTextInMemory) {
-  if (kIsSanitized) GTEST_SKIP() << "a sanitizer takes memory of its own";
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer uses additional memory";
   std::string text;
   for (int at = 0; at < 40000; ++at) text += "class " + Name(at) + " {\n};\n";
   EXPECT_LT(MemoryPerByteOf(text), 24);
 }
 
 TEST(DeepInheritanceTest, InstancesTakeAtMostTenTimesTheirTextInMemory) {
-  if (kIsSanitized) GTEST_SKIP() << "a sanitizer takes memory of its own";
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer uses additional memory";
   std::string text = std::string(kQualifiers) + "class X_Disk { [Key] uint32 Id; string Name; uint64 Size; };\n";
   for (int at = 0; at < 40000; ++at) {
     std::string const number = std::to_string(at);

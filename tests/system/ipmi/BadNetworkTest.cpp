@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// libipmiClient.so over a network that delays, loses, doubles and reorders. What a controller carried out is counted in its
-// event log.
+// Tests libipmiClient.so over a network that delays, loses, duplicates and reorders packets. The controller's event log counts
+// the commands that it has executed.
 
 #include "tests/system/ipmi/IpmiBed.h"
 
@@ -22,7 +22,7 @@ using TFate = TRelay::TFate;
 
 constexpr int kControllersPort = 6240;
 
-// The versions that the controller speaks. Only in the older one a message can be read on its way.
+// The protocol versions of the controller. Only with the older one can the test read messages on their way.
 enum EVersion { kVersion2, kVersion15 };
 
 class BadNetworkTest : public testing::Test {
@@ -42,7 +42,7 @@ protected:
     fSimulator->WaitUntilReady();
   }
 
-  // Puts a network between the client and the controller. The rule lives longer than the test's own variables.
+  // Places a bad network between the client and the controller. The rule outlives the local variables of the test.
   void Relay(EVersion version, TRelay::TRule const& rule) {
     fRelay.reset();
     fRelay.emplace(623, kControllersPort, [version, rule](TRelay::TDatagram& datagram) {
@@ -51,7 +51,7 @@ protected:
     });
   }
 
-  // How many events the controller logged meanwhile; asked for without the network between.
+  // The number of events that the controller has logged meanwhile; it is queried without the bad network.
   int NewEvents() {
     fClient.close();
     fClient.Open(kControllersPort);
@@ -79,10 +79,10 @@ void PrintTo(TMishap const& mishap, std::ostream* out) { *out << mishap.name; }
 
 class MishapTest : public BadNetworkTest, public testing::WithParamInterface<TMishap> {};
 
-// From the first query to the answer that the session is closed there are 7 requests in version 2.0 and 6 in 1.5.
+// From the first query to the answer that the session is closed, version 2.0 has 7 requests and version 1.5 has 6.
 int PlacesIn(EVersion version) { return version == kVersion2 ? 7 : 6; }
 
-TEST_P(MishapTest, IsGotOverInEveryPlace) {
+TEST_P(MishapTest, IsOvercomeAtEveryPlace) {
   TMishap const& mishap = GetParam();
   int const places = PlacesIn(mishap.version), placeOfCommand = places - 2;
   for (bool const isAnswer : {false, true})
@@ -94,8 +94,8 @@ TEST_P(MishapTest, IsGotOverInEveryPlace) {
       EXPECT_EQ(fClient.Open(623), kIpmiClientOk);
       EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
       fClient.close();
-      // The simulator carries out what comes twice: a command whose answer was lost, and a copy made on the way. A query
-      // that was sent again because this machine is busy moves the places by one.
+      // The simulator executes a command again that arrives twice: one whose answer was lost, or one that the network copied. A
+      // query that is repeated because this machine is busy moves the places by one.
       bool const mayComeTwice = place >= placeOfCommand && mishap.fate.size() != 1;
       EXPECT_THAT(NewEvents(), testing::AllOf(testing::Ge(1), testing::Le(mayComeTwice ? 2 : 1)));
     }
@@ -109,19 +109,19 @@ INSTANTIATE_TEST_SUITE_P(All, MishapTest,
                                          TMishap{"Delay2", kVersion2, {1300ms}}, TMishap{"Delay15", kVersion15, {1300ms}}),
                          [](auto const& row) { return row.param.name; });
 
-// ---- Mishaps to many ----
+// ---- Mishaps to many packets ----
 
 class EachVersionTest : public BadNetworkTest, public testing::WithParamInterface<EVersion> {};
 
 INSTANTIATE_TEST_SUITE_P(All, EachVersionTest, testing::Values(kVersion2, kVersion15),
                          [](auto const& row) { return row.param == kVersion2 ? "Version2" : "Version15"; });
 
-TEST_P(EachVersionTest, EveryPacketMayComeTwice) {
+TEST_P(EachVersionTest, EveryPacketMayArriveTwice) {
   for (auto const after : {0ms, 20ms}) {
     Relay(GetParam(), [after](auto const&) { return TFate{0ms, after}; });
     ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
     for (int n = 0; n < 5; ++n) EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
-    EXPECT_GE(NewEvents(), 5) << "the simulator carries out a copy of the packet before";
+    EXPECT_GE(NewEvents(), 5) << "the simulator also executes a copy of the previous packet";
   }
 }
 
@@ -130,18 +130,18 @@ TEST_P(EachVersionTest, AnswersMayTake3Seconds) {
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
   EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
-  EXPECT_EQ(NewEvents(), 1) << "a slow controller gets a command once";
+  EXPECT_EQ(NewEvents(), 1) << "a slow controller receives a command once";
 }
 
-TEST_F(BadNetworkTest, BothWaysMayTake3Seconds) {
+TEST_F(BadNetworkTest, BothDirectionsMayTake3Seconds) {
   Relay(kVersion2, [](auto const&) { return TFate{3000ms}; });
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
   EXPECT_EQ(NewEvents(), 1);
 }
 
-// One of five packets is lost, one of five doubled, and all overtake one another.
-TEST_P(EachVersionTest, AFifthMayBeLostAndAFifthDoubledAndAllOvertakeOneAnother) {
+// One of five packets is lost, one of five is duplicated, and their order changes.
+TEST_P(EachVersionTest, AFifthMayBeLostAndAFifthDuplicatedAndAllReordered) {
   for (unsigned seed : {1u, 2u}) {
     SCOPED_TRACE(seed);
     Relay(GetParam(), [random = std::mt19937(seed)](auto const&) mutable {
@@ -156,7 +156,7 @@ TEST_P(EachVersionTest, AFifthMayBeLostAndAFifthDoubledAndAllOvertakeOneAnother)
   }
 }
 
-TEST_F(BadNetworkTest, AFifthMayBeLostWhereAnswersTake3Seconds) {
+TEST_F(BadNetworkTest, AFifthMayBeLostWhenAnswersTake3Seconds) {
   Relay(kVersion2, [random = std::mt19937(7)](auto const& datagram) mutable {
     return random() % 5 == 0 ? TFate{} : TFate{datagram.isAnswer ? 3000ms : 0ms};
   });
@@ -164,7 +164,7 @@ TEST_F(BadNetworkTest, AFifthMayBeLostWhereAnswersTake3Seconds) {
   EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
 }
 
-// ---- A command is carried out once ----
+// ---- A command is executed once ----
 
 // Places in a signed packet of version 1.5.
 constexpr std::size_t kAuthentication = 4, kPacketNumber = 5, kMessageOfSession = 30, kRequestNumber = kMessageOfSession + 4,
@@ -180,7 +180,7 @@ std::vector<std::string> OfCommand(std::vector<std::string> datagrams, char comm
   return datagrams;
 }
 
-TEST_F(BadNetworkTest, ACommandThatIsSentAgainHasTheSameRequestNumber) {
+TEST_F(BadNetworkTest, ARepeatedCommandHasTheSameRequestNumber) {
   constexpr char kAddEvent = 0x44;
   Relay(kVersion15, [answers = 0](auto const& datagram) mutable {
     bool const isLost = datagram.isAnswer && IsOfCommand(datagram.bytes, kAddEvent) && ++answers <= 2;
@@ -190,7 +190,7 @@ TEST_F(BadNetworkTest, ACommandThatIsSentAgainHasTheSameRequestNumber) {
   EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
   EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
   auto const sent = OfCommand(fRelay->Requests(), kAddEvent);
-  ASSERT_EQ(sent.size(), 4u) << "three times the one, once the other";
+  ASSERT_EQ(sent.size(), 4u) << "the first command three times, the second once";
   std::set<std::string> packetNumbers;
   for (std::string const& request : sent) packetNumbers.insert(request.substr(kPacketNumber, 4));
   EXPECT_EQ(packetNumbers.size(), 4u);
@@ -199,7 +199,7 @@ TEST_F(BadNetworkTest, ACommandThatIsSentAgainHasTheSameRequestNumber) {
   EXPECT_NE(sent[3][kRequestNumber], sent[0][kRequestNumber]);
 }
 
-TEST_P(EachVersionTest, AnIdleSessionIsNoReasonToSendACommandTwice) {
+TEST_P(EachVersionTest, AnIdleSessionDoesNotMakeACommandRunTwice) {
   Relay(GetParam(), [](auto const&) { return TRelay::AtOnce(); });
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   std::this_thread::sleep_for(4300ms);
@@ -207,28 +207,28 @@ TEST_P(EachVersionTest, AnIdleSessionIsNoReasonToSendACommandTwice) {
   EXPECT_EQ(NewEvents(), 1);
 }
 
-TEST_F(BadNetworkTest, AForgottenSessionIsNoReasonToSendACommandInAnother) {
+TEST_F(BadNetworkTest, ACommandIsNotRepeatedInANewSession) {
   Relay(kVersion2, [](auto const&) { return TRelay::AtOnce(); });
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   StartController();
   std::size_t const before = fRelay->Requests().size();
-  EXPECT_EQ(fClient.AddEvent(), kIpmiClientNoAnswer) << "the controller may have carried it out";
+  EXPECT_EQ(fClient.AddEvent(), kIpmiClientNoAnswer) << "the controller may have executed it";
   auto const requests = fRelay->Requests();
-  EXPECT_GT(requests.size(), before + 1) << "in the session it is sent again";
+  EXPECT_GT(requests.size(), before + 1) << "the command is repeated in the same session";
   for (std::size_t n = before; n < requests.size(); ++n)
-    EXPECT_EQ(requests[n][5] & 0x3F, 0) << "nothing but messages is sent: no session is opened";
-  EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk) << "the next command opens one";
+    EXPECT_EQ(requests[n][5] & 0x3F, 0) << "only messages are sent: no session is opened";
+  EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk) << "the next command opens a session";
   EXPECT_EQ(NewEvents(), 1);
 }
 
-// ---- Answers that make no sense ----
+// ---- Invalid answers ----
 
-TEST_F(BadNetworkTest, AnEchoMakesNoSense) {
+TEST_F(BadNetworkTest, AnEchoIsAnInvalidAnswer) {
   TUdpPeer const echo(623, [](std::string const& datagram) { return datagram; });
   EXPECT_EQ(fClient.Open(623), kIpmiClientFail);
 }
 
-TEST_F(BadNetworkTest, AnEchoInEveryLaterPlaceMakesNoSenseEither) {
+TEST_F(BadNetworkTest, AnEchoAtEveryLaterPlaceIsAnInvalidAnswer) {
   int const placeOfCommand = PlacesIn(kVersion2) - 2;
   for (int place = 1; place < placeOfCommand; ++place) {
     SCOPED_TRACE(place);
@@ -241,8 +241,8 @@ TEST_F(BadNetworkTest, AnEchoInEveryLaterPlaceMakesNoSenseEither) {
   }
 }
 
-// The simulator takes a copy of RAKP message 1 for the beginning of another session, with less privilege.
-TEST_F(BadNetworkTest, APrivilegeThatALateCopyTookAwayIsAskedForAgain) {
+// The simulator treats a copy of RAKP message 1 as the start of another session, with a lower privilege.
+TEST_F(BadNetworkTest, APrivilegeLostThroughALateCopyIsRequestedAgain) {
   constexpr char kFirstNumber = 0x12;  // RAKP message 1
   Relay(kVersion2, [](auto const& datagram) {
     bool const isCopied = !datagram.isAnswer && datagram.bytes[5] == kFirstNumber;
@@ -254,8 +254,8 @@ TEST_F(BadNetworkTest, APrivilegeThatALateCopyTookAwayIsAskedForAgain) {
   EXPECT_EQ(NewEvents(), 1);
 }
 
-// The controller refuses a proof that does not fit the random number it holds: as after a copy of the step before.
-TEST_F(BadNetworkTest, AnOpeningThatGotOutOfStepIsBegunAnew) {
+// The controller refuses a proof that does not match its random number, as after a copy of the previous step.
+TEST_F(BadNetworkTest, AnOpeningWithAWrongProofIsRestarted) {
   constexpr char kProof = 0x14;  // RAKP message 3
   auto const proofs = std::make_shared<std::atomic<int>>(0);
   Relay(kVersion2, [proofs](TRelay::TDatagram& datagram) {

@@ -87,7 +87,7 @@ TSimulator::TSimulator(TSettings const& settings) {
 }
 
 TSimulator::~TSimulator() {
-  if (fSimulator > 0) GoOn();  // else it could not end
+  if (fSimulator > 0) GoOn();  // a stopped process cannot end
   ::kill(fScript, SIGTERM);
   ::waitpid(fScript, nullptr, 0);
 }
@@ -177,9 +177,9 @@ void TRelay::PassOn(TWaiting const& waiting) {
 }
 
 std::optional<std::string> AskOf(int port, std::string const& datagram) {
-  // One source address for all that is asked, as a session has.
+  // One source address for all requests, as in a session.
   static TUniqueFd const socket(::socket(AF_INET, SOCK_DGRAM, 0));
-  while (IsReadable(socket.get(), 0)) Receive(socket.get(), nullptr);  // an answer that came too late
+  while (IsReadable(socket.get(), 0)) Receive(socket.get(), nullptr);  // discards a late answer
   sockaddr_in const address = Loopback(port);
   ::sendto(socket.get(), datagram.data(), datagram.size(), 0, reinterpret_cast<sockaddr const*>(&address), sizeof address);
   if (!IsReadable(socket.get(), 300)) return std::nullopt;

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// Management controllers for tests: the simulator ipmi_sim on addresses of a network namespace, peers that misbehave, and
-// the platform library that talks to them.
+// Management controllers for tests: the simulator ipmi_sim at addresses of a network namespace, peers that misbehave, and the
+// platform library that connects to them.
 
 #include "core/Handles.h"
 #include "platform/include/ipmiClient.h"
@@ -21,14 +21,14 @@ namespace NQRVZEP20 {
 // Whether the simulator is installed and this user may make network namespaces. A test that needs more than loopback's high
 // ports calls EnterNetworkNamespace first.
 bool HasIpmiBed();
-bool CanMakeNetworks();  // iproute2, and the right to make network namespaces
+bool CanMakeNetworks();  // iproute2 is installed and this user may create network namespaces
 inline constexpr char const* kIpmiBedNeeds = "ipmi_sim (package openipmi), ip (package iproute2), and root";
 
-// Moves the calling thread, and the processes that it starts, into a network of its own in which only loopback is up. For
-// the rest of the process.
+// Moves the calling thread, and the processes that it starts, into a new network namespace in which only loopback is up, for the
+// rest of the process.
 void EnterNetworkNamespace();
 
-// A simulated controller; ended with the object. Its account is zepadmin, its FRU data holds the given texts.
+// A simulated controller, ended by the destructor. Its account is zepadmin; its FRU data contain the given texts.
 class TSimulator {
 public:
   struct TSettings {
@@ -37,7 +37,7 @@ public:
     std::string model = "1234AB7";
     std::string serialNumber = "KQ12345";
     std::string password = "zeppass1";
-    std::string fru = {};  // a whole FRU image instead of the two
+    std::string fru = {};  // a complete FRU image instead of the two texts
   };
 
   explicit TSimulator(TSettings const& settings);
@@ -45,10 +45,10 @@ public:
   TSimulator(TSimulator const&) = delete;
   TSimulator& operator=(TSimulator const&) = delete;
 
-  // It starts in the background: waits until it listens. To be called before it is used.
+  // Waits until the simulator, which starts in the background, listens. Call this before using it.
   void WaitUntilReady();
 
-  void Stop() const;  // it receives nothing until it goes on
+  void Stop() const;  // suspends it until GoOn
   void GoOn() const;
 
 private:
@@ -57,8 +57,8 @@ private:
   TUniqueFd fOutput;
 };
 
-// Receives the datagrams of a UDP port of 127.0.0.1 on a thread of its own and hands them to a function, whose result, if
-// any, is sent back.
+// Receives the datagrams of a UDP port of 127.0.0.1 on a separate thread and passes them to a function. Its result, if any, is
+// sent back.
 class TUdpPeer {
 public:
   using TAnswer = std::function<std::optional<std::string>(std::string const&)>;
@@ -78,16 +78,16 @@ private:
   std::thread fThread;
 };
 
-// A bad network between clients and a controller: passes the datagrams that come to a UDP port of 127.0.0.1 on to the
-// controller at another, and its answers back, as a rule says. On a thread of its own.
+// A bad network between clients and a controller: forwards the datagrams that arrive at a UDP port of 127.0.0.1 to the controller
+// at another port, and its answers back, according to a rule. Runs on a separate thread.
 class TRelay {
 public:
   struct TDatagram {
     bool isAnswer;
-    int place;  // among those of its direction, from 0
+    int place;  // the number of the datagram in its direction, from 0
     std::string bytes;
   };
-  // After what delay each copy of a datagram is passed on; without any it is lost.
+  // The delay of each copy of a datagram; without a delay, the datagram is lost.
   using TFate = std::vector<std::chrono::milliseconds>;
   // May change the datagram's bytes.
   using TRule = std::function<TFate(TDatagram&)>;
@@ -95,7 +95,7 @@ public:
   TRelay(int port, int controllersPort, TRule rule);
   ~TRelay();
 
-  std::vector<std::string> Requests() const;  // all that came from clients, oldest first
+  std::vector<std::string> Requests() const;  // all datagrams from clients, oldest first
 
   static TFate AtOnce() { return {std::chrono::milliseconds(0)}; }
 
@@ -108,7 +108,7 @@ private:
 
   TUniqueFd fClients, fController;
   TRule fRule;
-  sockaddr_in fClient{};  // the latest
+  sockaddr_in fClient{};  // the client of the last request
   int fPlaces[2] = {0, 0};
   std::multimap<std::chrono::steady_clock::time_point, TWaiting> fWaiting;
   mutable std::mutex fMutex;
@@ -120,10 +120,10 @@ private:
 // Sends a datagram on to the controller at 127.0.0.1 and that port and returns its answer.
 std::optional<std::string> AskOf(int port, std::string const& datagram);
 
-// Takes version 2.0 out of a controller's answer to Get Channel Authentication Capabilities; other packets stay as they are.
+// Removes version 2.0 from a controller's answer to Get Channel Authentication Capabilities; other packets are not changed.
 std::string WithoutVersion2(std::string answer);
 
-// libipmiClient.so of the build, loaded as the core loads it.
+// The build's libipmiClient.so, loaded in the same way as the core loads it.
 struct TIpmiClientLibrary {
   TIpmiClientLibrary();
 
@@ -131,21 +131,21 @@ struct TIpmiClientLibrary {
   decltype(&SendIpmiCommand) send;
   decltype(&CloseConnection) close;
 
-  // Opens as zepadmin.
+  // Opens a session as zepadmin.
   int Open(int port, char const* host = "127.0.0.1") const;
 
   // Reads FRU data of device 0.
   struct TRead {
     int result;
     int completionCode;
-    std::string data;  // the count and what follows
+    std::string data;  // the count and the data after it
   };
   TRead ReadFru(unsigned offset, unsigned char count, unsigned char device = 0) const;
 
   // Adds an entry to the controller's event log; returns the library's result.
   int AddEvent() const;
 
-  // How many entries the event log has; -1 when the controller does not tell.
+  // The number of entries in the event log; -1 when the controller does not report it.
   int Events() const;
 };
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// libipmiClient.so against simulated controllers.
+// Tests libipmiClient.so with simulated controllers.
 
 #include "tests/system/ipmi/IpmiBed.h"
 
@@ -57,7 +57,7 @@ TEST_F(IpmiClientTest, ReadsFruData) {
   EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
 }
 
-TEST_F(IpmiClientTest, ARefusedCommandTellsWhy) {
+TEST_F(IpmiClientTest, ARefusedCommandReturnsTheCompletionCode) {
   Start();
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   struct TRow {
@@ -66,7 +66,7 @@ TEST_F(IpmiClientTest, ARefusedCommandTellsWhy) {
     unsigned char device;
     int completionCode;
   };
-  TRow const rows[] = {{"an offset behind the data", 0x7000, 0, 0xC9}, {"no such device", 0, 9, 0xCC}};
+  TRow const rows[] = {{"an offset after the data", 0x7000, 0, 0xC9}, {"no such device", 0, 9, 0xCC}};
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.what);
     auto const read = fClient.ReadFru(row.offset, 7, row.device);
@@ -75,16 +75,16 @@ TEST_F(IpmiClientTest, ARefusedCommandTellsWhy) {
     EXPECT_NE(read.completionCode, 0xFF);
     EXPECT_EQ(read.data, "");
   }
-  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345") << "the session goes on";
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345") << "the session continues";
 }
 
-TEST_F(IpmiClientTest, AnAnswerMayBeShorterThanAskedFor) {
+TEST_F(IpmiClientTest, AnAnswerMayBeShorterThanRequested) {
   Start();
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   EXPECT_EQ(fClient.ReadFru(1024 - 3, 0x1E).data, "\x03\xFF\xFF\xFF");
 }
 
-TEST_F(IpmiClientTest, EachReasonNotToOpenHasItsCode) {
+TEST_F(IpmiClientTest, EachReasonForAFailureToOpenHasItsCode) {
   Start();
   struct TRow {
     char const* what;
@@ -131,7 +131,7 @@ TEST_F(IpmiClientTest, ASilentControllerIsGivenUpAfter7Seconds) {
   EXPECT_EQ(fClient.Open(623), kIpmiClientNoAnswer);
   EXPECT_GT(SecondsSince(start), 6.9);
   EXPECT_LT(SecondsSince(start), 60);
-  EXPECT_GT(silent.Received(), 1) << "it should have been asked more than once";
+  EXPECT_GT(silent.Received(), 1) << "the query should have been repeated";
 }
 
 TEST_F(IpmiClientTest, ASessionWithASilentControllerIsClosedWithin1500Milliseconds) {
@@ -156,7 +156,7 @@ TEST_F(IpmiClientTest, TheNextAddressOfAHostIsTriedAfterASilentOne) {
   EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
 }
 
-TEST_F(IpmiClientTest, GarbageIsNoSession) {
+TEST_F(IpmiClientTest, GarbageDoesNotOpenASession) {
   std::mt19937 random(5);
   TUdpPeer garbage(623, [&](std::string const&) {
     std::string bytes(random() % 80, '\0');
@@ -170,7 +170,7 @@ TEST_F(IpmiClientTest, GarbageIsNoSession) {
   EXPECT_GT(garbage.Received(), 0);
 }
 
-TEST_F(IpmiClientTest, AMangledAnswerIsNeverTakenForTheTruth) {
+TEST_F(IpmiClientTest, ADamagedAnswerIsNeverAccepted) {
   Start({"127.0.0.1", 6240});
   std::mt19937 random(6);
   TUdpPeer mangler(623, [&](std::string const& datagram) {
@@ -188,7 +188,7 @@ TEST_F(IpmiClientTest, AMangledAnswerIsNeverTakenForTheTruth) {
   EXPECT_GT(mangler.Received(), 3);
 }
 
-TEST_F(IpmiClientTest, OpeningClosesTheSessionBefore) {
+TEST_F(IpmiClientTest, OpeningClosesThePreviousSession) {
   Start();
   // The simulator has room for 63 sessions.
   for (int round = 0; round < 70; ++round) ASSERT_EQ(fClient.Open(623), kIpmiClientOk) << round;
@@ -196,7 +196,7 @@ TEST_F(IpmiClientTest, OpeningClosesTheSessionBefore) {
   EXPECT_EQ(fClient.ReadFru(0, 1).result, kIpmiClientNoSession) << "also when opening fails";
 }
 
-// A process that holds a session until the object ends.
+// A process that keeps a session open until the object is destroyed.
 class TSessionHolder {
 public:
   explicit TSessionHolder(TIpmiClientLibrary const& client) {
@@ -228,7 +228,7 @@ private:
   int fResult;
 };
 
-TEST_F(IpmiClientTest, AControllerWithoutASessionLeftIsBusy) {
+TEST_F(IpmiClientTest, AControllerWithoutAFreeSessionIsBusy) {
   Start();
   constexpr int kRoom = 63;
   std::list<TSessionHolder> holders;
@@ -238,14 +238,14 @@ TEST_F(IpmiClientTest, AControllerWithoutASessionLeftIsBusy) {
 
 TEST_F(IpmiClientTest, ClosingEndsTheSession) {
   Start();
-  EXPECT_EQ(fClient.close(), 0) << "also without one";
+  EXPECT_EQ(fClient.close(), 0) << "also without a session";
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   EXPECT_EQ(fClient.close(), 0);
   EXPECT_EQ(fClient.ReadFru(0, 1).result, kIpmiClientNoSession);
   EXPECT_EQ(fClient.close(), 0);
 }
 
-TEST_F(IpmiClientTest, ArgumentsThatCannotBeUsedAreRefused) {
+TEST_F(IpmiClientTest, InvalidArgumentsAreRefused) {
   Start();
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   unsigned char bytes[256] = {};
@@ -262,7 +262,7 @@ TEST_F(IpmiClientTest, ArgumentsThatCannotBeUsedAreRefused) {
   EXPECT_GT(length, 10);
 }
 
-TEST_F(IpmiClientTest, AControllerStoppedInMidSessionGivesNoAnswerAndComesBack) {
+TEST_F(IpmiClientTest, AControllerStoppedDuringASessionIsUsedAgainWhenItContinues) {
   TSimulator const& simulator = Start();
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   ASSERT_EQ(fClient.ReadFru(0x1CC, 7).result, kIpmiClientOk);
@@ -275,9 +275,9 @@ TEST_F(IpmiClientTest, AControllerStoppedInMidSessionGivesNoAnswerAndComesBack) 
   EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345") << "the next command tries again";
 }
 
-// ---- A controller that speaks 1.5 only ----
+// ---- A controller with only version 1.5 ----
 
-TEST_F(IpmiClientTest, AControllerThatSpeaksOnly15IsSpokenToLikeThat) {
+TEST_F(IpmiClientTest, AControllerWithOnlyVersion15GetsNoVersion2Packets) {
   Start({"127.0.0.1", 6240});
   std::atomic<int> asked2{0};
   TUdpPeer const relay(623, [&](std::string const& datagram) -> std::optional<std::string> {

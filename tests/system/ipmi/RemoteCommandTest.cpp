@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// The identity of remote servers, from simulated controllers: by the library, and by zep.
+// Tests reading the identity of remote servers from simulated controllers, with the library and with zep.
 
 #include "TOSSpecific.h"
 #include "tests/system/ipmi/IpmiBed.h"
@@ -28,7 +28,7 @@ protected:
     EnterNetworkNamespace();
   }
 
-  // A FRU image of that size with the type and model at its place.
+  // A FRU image of that size, with the type and model at their place.
   std::string FruOf(std::size_t size) {
     std::string image(size, ' ');
     image.replace(0, 8, "\1\0\0\0\0\0\0\xFF"s);
@@ -44,7 +44,7 @@ protected:
 
 class RemoteLibraryTest : public RemoteSystemTest {
 protected:
-  // The library's own search finds libipmiClient.so only beside libzepcore.so, which is where the build has it.
+  // The library searches libipmiClient.so only beside libzepcore.so, where the build puts it.
   static std::vector<std::string> IdentityOf(std::string const& host, std::string const& password = "zeppass1") {
     return {TOSSpecific::GetRemoteMT(host, "zepadmin", password), TOSSpecific::GetRemoteMachineModel(host, "zepadmin", password),
             TOSSpecific::GetRemoteMSN(host, "zepadmin", password)};
@@ -60,15 +60,15 @@ TEST_F(RemoteLibraryTest, ReadsTheIdentityOfTheControllersServer) {
   EXPECT_THAT(IdentityOf("127.0.0.1", "wrong"), testing::ElementsAre("", "", ""));
 }
 
-TEST_F(RemoteLibraryTest, WhatTheControllerRefusesIsNotAvailable) {
+TEST_F(RemoteLibraryTest, DataThatTheControllerRefusesAreNotAvailable) {
   TSimulator::TSettings settings;
-  settings.fru = FruOf(0x1C0);  // ends in front of the serial number
+  settings.fru = FruOf(0x1C0);  // ends before the serial number
   TSimulator simulator(settings);
   simulator.WaitUntilReady();
   EXPECT_THAT(IdentityOf("127.0.0.1"), testing::ElementsAre("1234", "AB7", "N/A"));
 }
 
-TEST_F(RemoteLibraryTest, AShortAnswerGivesWhatIsThere) {
+TEST_F(RemoteLibraryTest, AShortAnswerGivesItsBytes) {
   TSimulator::TSettings settings;
   settings.fru = FruOf(0x1CC + 3);
   TSimulator simulator(settings);
@@ -95,7 +95,7 @@ protected:
   zep::TInstallation fZep;
 };
 
-TEST_F(ZepRemoteTest, TellsTypeModelAndSerialNumber) {
+TEST_F(ZepRemoteTest, PrintsTypeModelAndSerialNumber) {
   TSimulator simulator({});
   simulator.WaitUntilReady();
   zep::TRun const run = Run({"127.0.0.1"});
@@ -111,9 +111,10 @@ TEST_F(ZepRemoteTest, TellsTypeModelAndSerialNumber) {
   EXPECT_EQ(zep::JsonOf(json)["serialNumber"], "KQ12345");
 
   WriteFile(fDir.Path("password"), "zeppass1\nnot this line");
-  EXPECT_EQ(Run({"127.0.0.1", "--password-file", fDir.Path("password")}, "wrong").status, 0) << "the file counts first";
+  EXPECT_EQ(Run({"127.0.0.1", "--password-file", fDir.Path("password")}, "wrong").status, 0) << "the file takes precedence";
   WriteFile(fDir.Path("password"), "zeppass1\r\n");
-  EXPECT_EQ(Run({"127.0.0.1", "--password-file", fDir.Path("password")}, "wrong").status, 0) << "of another system's editor";
+  EXPECT_EQ(Run({"127.0.0.1", "--password-file", fDir.Path("password")}, "wrong").status, 0)
+      << "a line end written by another system's editor";
 }
 
 TEST_F(ZepRemoteTest, AWrongPasswordIsReported) {
@@ -147,7 +148,7 @@ TEST_F(ZepRemoteTest, AMissingPartIsReported) {
   EXPECT_EQ(zep::JsonOf(run)["reason"], "the controller did not report everything");
 }
 
-TEST_F(ZepRemoteTest, FruDataThatNobodyProgrammedAreReportedAsSuch) {
+TEST_F(ZepRemoteTest, UnprogrammedFruDataAreReportedAsSuch) {
   struct TRow {
     std::size_t erasedFrom, erasedTo;
     char const *type, *model, *serialNumber;  // null: none
@@ -157,7 +158,7 @@ TEST_F(ZepRemoteTest, FruDataThatNobodyProgrammedAreReportedAsSuch) {
       {0x1AC, 0x200, nullptr, nullptr, nullptr, 1,
        "not programmed in the controller's FRU data (0xFF): machine type, model, serial number"},
       {0x1C0, 0x200, "1234", "AB7", nullptr, 2, "not programmed in the controller's FRU data (0xFF): serial number"},
-      {0x1B3, 0x1CC, "1234", "AB7", "KQ12345", 0, nullptr},  // right behind the model
+      {0x1B3, 0x1CC, "1234", "AB7", "KQ12345", 0, nullptr},  // immediately after the model
       {0x1B0, 0x1CC, "1234", nullptr, "KQ12345", 2, "not programmed in the controller's FRU data (0xFF): model"},
   };
   auto const orNull = [](char const* text) { return text != nullptr ? nlohmann::json(text) : nlohmann::json(nullptr); };
@@ -203,7 +204,7 @@ TEST_F(ZepRemoteTest, AControllerThatAnswersAfter1500MillisecondsIsQueriedWithTh
   EXPECT_THAT(run.output, HasSubstr("Serial number    "));
 }
 
-TEST_F(ZepRemoteTest, AHostHasItsTime) {
+TEST_F(ZepRemoteTest, EachHostHasATimeLimit) {
   TUdpPeer silent(623, [](std::string const&) { return std::nullopt; });
   auto const start = TClock::now();
   zep::TRun const run = Run({"127.0.0.1", "--timeout", "1"});
@@ -212,8 +213,8 @@ TEST_F(ZepRemoteTest, AHostHasItsTime) {
   EXPECT_EQ(run.errors, "zep: 127.0.0.1: not done after 1 s; --timeout allows more\n");
 }
 
-// Controllers that answer, that refuse the account, that are silent, and that cannot be reached.
-TEST_F(ZepRemoteTest, AListOfAThousandIsDoneWhateverBecomesOfSome) {
+// The list has controllers that answer, that refuse the account, that are silent, and that cannot be reached.
+TEST_F(ZepRemoteTest, AListOfAThousandHostsIsCompletedAlthoughSomeFail) {
   ASSERT_EQ(std::system(
                 "ip link add silent0 type veth peer name silent1 && ip link set silent0 arp off up && ip link set silent1 up && "
                 "ip addr add 192.0.2.1/24 dev silent0 && ip route add unreachable 198.51.100.0/24"),

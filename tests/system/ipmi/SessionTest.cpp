@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// A session of libipmiClient.so's with other times than the library's.
+// Tests sessions of libipmiClient.so with other time limits than the library's.
 
 #include "platform/ipmi/TSession.h"
 
@@ -40,7 +40,7 @@ protected:
 
   static ipmi::TTarget Target() { return {"127.0.0.1", "623", "zepadmin", "zeppass1"}; }
 
-  // Nothing is sent again however busy this machine is.
+  // Nothing is repeated, however busy this machine is.
   static ipmi::TTimes Patient() {
     ipmi::TTimes times;
     times.contact = times.step = times.close = ipmi::TWaits(3, 20s);
@@ -57,7 +57,7 @@ protected:
   }
   static int Events(ipmi::TSession& session) { return session.Send(kStorage, kEventLogInfo, {}).data.at(1); }
 
-  // What was sent after the first so many requests: "query" for one of version 1.5, else the kind of payload.
+  // The requests after the first `count`: "query" for one of version 1.5, otherwise the kind of payload.
   std::vector<std::string> RequestsAfter(std::size_t first) const {
     std::map<int, std::string> const kinds = {{0, "message"}, {0x10, "open"}, {0x12, "RAKP 1"}, {0x14, "RAKP 3"}};
     std::vector<std::string> found, all = fRelay->Requests();
@@ -69,7 +69,7 @@ protected:
   std::optional<TRelay> fRelay;
 };
 
-TEST_F(SessionTest, ASessionInUseStays) {
+TEST_F(SessionTest, ASessionInUseIsKept) {
   ipmi::TSession session(Target(), Patient());
   session.Open();
   AddEvent(session);
@@ -85,7 +85,7 @@ TEST_F(SessionTest, AnIdleSessionIsRenewedBeforeTheCommandIsSent) {
   std::this_thread::sleep_for(100ms);
   AddEvent(session);
   EXPECT_THAT(RequestsAfter(before), ElementsAre("message", "query", "open", "RAKP 1", "RAKP 3", "message", "message"))
-      << "closed, opened, made administrator, and the command";
+      << "closing, opening, setting the privilege, and the command";
   EXPECT_EQ(Events(session), 1);
 }
 
@@ -98,7 +98,7 @@ TEST_F(SessionTest, AnIdleSessionThatTheControllerForgotIsRenewedToo) {
   EXPECT_EQ(Events(session), 1);
 }
 
-TEST_F(SessionTest, AControllerThatCalculatesForTwoSecondsIsNotAskedAgainMeanwhile) {
+TEST_F(SessionTest, AControllerThatNeedsTwoSecondsIsNotQueriedAgainMeanwhile) {
   fRelay.reset();
   fRelay.emplace(623, kControllersPort, [](TRelay::TDatagram const& datagram) {
     constexpr unsigned char kProofOfPassword = 0x13;  // RAKP 2
@@ -111,8 +111,8 @@ TEST_F(SessionTest, AControllerThatCalculatesForTwoSecondsIsNotAskedAgainMeanwhi
   EXPECT_EQ(std::count(requests.begin(), requests.end(), "RAKP 1"), 1);
 }
 
-// The times of the library, shortened: an opening takes more answers than these allow.
-TEST_F(SessionTest, AnOpeningEndsWithItsWholeTime) {
+// The library's time limits, shortened: an opening needs more answers than these allow.
+TEST_F(SessionTest, AnOpeningEndsAtItsTimeLimit) {
   fRelay.reset();
   fRelay.emplace(623, kControllersPort,
                  [](TRelay::TDatagram const& datagram) { return TRelay::TFate{datagram.isAnswer ? 500ms : 0ms}; });
@@ -123,10 +123,10 @@ TEST_F(SessionTest, AnOpeningEndsWithItsWholeTime) {
   EXPECT_THROW(session.Open(), ipmi::TFailure);
   auto const taken = std::chrono::steady_clock::now() - start;
   EXPECT_GE(taken, 1200ms);
-  EXPECT_LT(taken, 10s);  // the steps themselves would wait for longer
+  EXPECT_LT(taken, 10s);  // the single steps would wait longer
 }
 
-TEST_F(SessionTest, ACommandEndsWithItsWholeTime) {
+TEST_F(SessionTest, ACommandEndsAtItsTimeLimit) {
   ipmi::TTimes times = Patient();
   times.command = ipmi::TWaits(3, 20s);
   times.wholeCommand = 1200ms;
@@ -140,7 +140,7 @@ TEST_F(SessionTest, ACommandEndsWithItsWholeTime) {
   EXPECT_LT(taken, 15s);
 }
 
-TEST_F(SessionTest, AMessageThatIsTooLongForVersion15IsRefusedAndTheSessionGoesOn) {
+TEST_F(SessionTest, AMessageThatIsTooLongForVersion15IsRefusedAndTheSessionContinues) {
   fRelay.reset();
   fRelay.emplace(623, kControllersPort, [](TRelay::TDatagram& datagram) {
     if (datagram.isAnswer) datagram.bytes = WithoutVersion2(datagram.bytes);
@@ -155,9 +155,9 @@ TEST_F(SessionTest, AMessageThatIsTooLongForVersion15IsRefusedAndTheSessionGoesO
   EXPECT_EQ(fRelay->Requests().size(), before + 1) << "in the same session";
 }
 
-// ---- What the simulator cannot do ----
+// ---- Cases that the simulator does not support ----
 
-TEST(EnvelopeTest, BothCipherSuitesCarryAMessageAndNoDamagedOne) {
+TEST(EnvelopeTest, BothCipherSuitesAcceptAMessageAndRefuseADamagedOne) {
   struct TRow {
     char const* name;
     ipmi::TCipherSuite suite;

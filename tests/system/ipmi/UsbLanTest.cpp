@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// ovdusblan.so on interfaces of a network namespace, and the whole way to controllers behind them.
+// Tests ovdusblan.so with the interfaces of a network namespace, and the connection to the controllers that they reach.
 
 #include "IIPMILan.h"
 #include "TRootObject.h"
@@ -51,11 +51,11 @@ protected:
   decltype(&BringupOvdLan) fBringUp = nullptr;
 };
 
-TEST_F(UsbLanTest, WithoutSuchAnInterfaceThereIsNoNode) {
+TEST_F(UsbLanTest, WithoutAUsbInterfaceNoNodeExists) {
   EXPECT_EQ(fNodes(), 0);
   EXPECT_EQ(fQuery(0), 0);
   EXPECT_EQ(fBringUp(0), ENODEV);
-  EXPECT_EQ(AddressesOf("lo"), "127.0.0.1/8 ") << "loopback is left alone";
+  EXPECT_EQ(AddressesOf("lo"), "127.0.0.1/8 ") << "loopback is not changed";
 }
 
 TEST_F(UsbLanTest, AnInterfaceGetsAnAddressInTheControllersRange) {
@@ -65,12 +65,12 @@ TEST_F(UsbLanTest, AnInterfaceGetsAnAddressInTheControllersRange) {
   EXPECT_EQ(fQuery(0), 0);
   EXPECT_EQ(fBringUp(0), 0);
   EXPECT_EQ(fQuery(0), 1);
-  EXPECT_EQ(fQuery(1), 0) << "the other is left alone";
+  EXPECT_EQ(fQuery(1), 0) << "the other interface is not changed";
   EXPECT_EQ(AddressesOf("bmc0"), "169.254.95.1/24 ");
   EXPECT_EQ(AddressesOf("bmc1"), "");
   EXPECT_EQ(fBringUp(1), 0);
   EXPECT_EQ(AddressesOf("bmc1"), "169.254.96.1/24 ");
-  EXPECT_EQ(fBringUp(1), 0) << "once more changes nothing";
+  EXPECT_EQ(fBringUp(1), 0) << "a second call changes nothing";
   EXPECT_EQ(AddressesOf("bmc1"), "169.254.96.1/24 ");
   for (int node : {-1, 2, 16, 2147483647}) {
     EXPECT_EQ(fQuery(node), 0) << node;
@@ -78,7 +78,7 @@ TEST_F(UsbLanTest, AnInterfaceGetsAnAddressInTheControllersRange) {
   }
 }
 
-TEST_F(UsbLanTest, AMissingInterfaceMovesNoOtherToItsNode) {
+TEST_F(UsbLanTest, AMissingInterfaceDoesNotRenumberTheOthers) {
   RunShell("ip link add bmc0 type veth peer name bmc1 && ip link add verylongname012 type veth peer name far0");
   ::setenv("ZEP_USBLAN_INTERFACES", "absent bmc0 verylongname0123 bmc1", 1);
   EXPECT_EQ(fNodes(), 4);
@@ -90,25 +90,25 @@ TEST_F(UsbLanTest, AMissingInterfaceMovesNoOtherToItsNode) {
   EXPECT_EQ(fBringUp(3), 0);
   EXPECT_EQ(AddressesOf("bmc0"), "169.254.96.1/24 ");
   EXPECT_EQ(AddressesOf("bmc1"), "169.254.98.1/24 ");
-  EXPECT_EQ(AddressesOf("verylongname012"), "") << "its name is only the beginning of one that is missing";
+  EXPECT_EQ(AddressesOf("verylongname012"), "") << "its name is only the start of the name of a missing interface";
 }
 
-TEST_F(UsbLanTest, OtherAddressesStay) {
+TEST_F(UsbLanTest, OtherAddressesAreKept) {
   RunShell(
       "ip link add bmc0 type veth peer name far0 && ip addr add 10.1.2.3/24 dev bmc0 && ip addr add 169.254.95.1/24 dev bmc0");
   ::setenv("ZEP_USBLAN_INTERFACES", "bmc0", 1);
-  EXPECT_EQ(fQuery(0), 0) << "it is down";
-  EXPECT_EQ(fBringUp(0), 0) << "the address being there already";
+  EXPECT_EQ(fQuery(0), 0) << "the interface is down";
+  EXPECT_EQ(fBringUp(0), 0) << "the interface already has the address";
   EXPECT_EQ(fQuery(0), 1);
   EXPECT_EQ(AddressesOf("bmc0"), "10.1.2.3/24 169.254.95.1/24 ");
 
   RunShell("ip addr flush dev bmc0 && ip addr add 169.254.7.8/16 dev bmc0");
-  EXPECT_EQ(fQuery(0), 1) << "the whole range is reached";
+  EXPECT_EQ(fQuery(0), 1) << "the complete range is reachable";
   EXPECT_EQ(fBringUp(0), 0);
   EXPECT_EQ(AddressesOf("bmc0"), "169.254.7.8/16 ");
 }
 
-TEST_F(UsbLanTest, WithoutTheRightToConfigureItReportsEPERM) {
+TEST_F(UsbLanTest, WithoutPermissionToConfigureItReturnsEPERM) {
   RunShell("ip link add bmc0 type veth peer name far0");
   ::setenv("ZEP_USBLAN_INTERFACES", "bmc0", 1);
   pid_t const child = ::fork();
@@ -127,14 +127,14 @@ protected:
     NEEDS(HasIpmiBed(), kIpmiBedNeeds);
     UsbLanTest::SetUp();
     if (HasFatalFailure() || IsSkipped()) return;
-    std::filesystem::current_path(ZEP_BUILD_DIR "/lib");  // where ovdusblan.so is
+    std::filesystem::current_path(ZEP_BUILD_DIR "/lib");  // the directory with ovdusblan.so
   }
 
   static std::string SerialNumberBehindTheSession() { return TIpmiClientLibrary().ReadFru(0x1CC, 7).data; }
 };
 
 TEST_F(NodesTest, TheLinkBringsTheInterfaceUpAndConnects) {
-  // The other end of the cable, with the controller, lies in a network namespace of its own.
+  // The other end of the cable, with the controller, is in another network namespace.
   RunShell("ip link add bmc0 type veth peer name controller0");
   std::string const space = "zep-usblan-" + std::to_string(::getpid());
   RunShell("ip netns add " + space + " && ip link set controller0 netns " + space + " && ip -n " + space +
@@ -163,7 +163,7 @@ TEST_F(NodesTest, TheLinkBringsTheInterfaceUpAndConnects) {
   RunShell("ip netns del " + space);
 }
 
-TEST_F(NodesTest, SixteenNodesAreConnectedToOneAfterTheOther) {
+TEST_F(NodesTest, SixteenNodesAreConnectedOneByOne) {
   std::vector<std::unique_ptr<TSimulator>> simulators;
   IIPMILan& link = *IIPMILan::Initialize();
   for (int node = 0; node < 16; ++node) {

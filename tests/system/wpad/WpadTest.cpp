@@ -122,7 +122,7 @@ TEST_F(WpadTest, AnyPacketIsAReply) {
       {"no reply at all, but with the option", std::string(2 * 240, 'f') + "fc0175", "u"},
       {"a longer message than is taken", std::string(2 * 240, '0') + "fc03", std::string(3, '\0')},
       {"all ones", [] { return std::string(2 * 1472, 'f'); }(), ""},
-      {"a length behind the end", std::string(2 * 240, '0') + "01ff" + std::string(2 * 255, '1') + "fcff61",
+      {"a length after the end", std::string(2 * 240, '0') + "01ff" + std::string(2 * 255, '1') + "fcff61",
        "a" + std::string(254, '\0')},
   };
   for (auto const& row : rows) {
@@ -216,7 +216,7 @@ TEST_F(WpadTest, InterfaceThatCannotBeReadIsSkipped) {
 }
 
 TEST_F(WpadTest, NothingIsThrownWhenNoSocketCanBeOpened) {
-  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, which needs descriptors of its own";
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer needs additional descriptors";
   TLines const noPipe = {"[Debug] ERROR: SpawnProcess - pipe call failed!"};
   TDiscovery const found = Discover("ZEP_WPAD_NO_DESCRIPTORS=1");
   EXPECT_EQ(found.url, "");

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// zep wpad, as users run it, beside real DHCP servers.
+// Tests zep wpad as users run it, with real DHCP servers.
 
 #include "tests/system/wpad/WpadBed.h"
 #include "tests/tools/zep/Envelope.h"
@@ -31,7 +31,7 @@ protected:
   }
 };
 
-// zep waits a twentieth of the time.
+// zep waits for an eighth of the time.
 std::string const kInHurry = "LD_PRELOAD=$HURRY ";
 
 TEST_F(ZepWpadTest, PrintsTheUrlTheMessagesAndTheReplies) {

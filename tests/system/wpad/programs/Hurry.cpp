@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// To be preloaded: whoever waits by sleep or poll waits an eighth of the time.
+// A library to be preloaded: sleep and poll wait for an eighth of the time.
 
 #include <dlfcn.h>
 #include <poll.h>
