@@ -195,7 +195,7 @@ public:
   // The result is 0 when the child exited with 0, and -1 in every other case, also when the program could not be executed.
   // The exit code itself is not returned. Kept. A select or waitpid that a signal interrupts is not retried. When the pipe's
   // read end is a descriptor that select cannot watch (1024 and above), nothing is run and the result is -1. When no process
-  // can be created, an error is logged and kZEPStatusFail is thrown.
+  // can be created, an error is logged and a TZEPFailure with kZEPStatusFail is thrown.
 
   // Runs the file `path` with `argv0` as its name, the arguments `args`, and exactly the environment `env` (entries
   // "NAME=value").
@@ -220,7 +220,7 @@ public:
   static void CapFileViaProc(std::string program, std::vector<std::string> args, std::string fileName, std::string& contents);
 
   // The complete contents of a file, which are also logged at debug severity. A file that cannot be opened is logged as an
-  // error and throws kZEPStatusFileNotFound; a failing read is handled as in GetFileContents.
+  // error and throws a TZEPFailure with kZEPStatusFileNotFound; a failing read is handled as in GetFileContents.
   static std::string CaptureFile(std::string path);
 
   // The complete contents of a file. A file that cannot be opened is logged in two lines at debug severity and gives an empty

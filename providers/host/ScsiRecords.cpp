@@ -122,8 +122,8 @@ TRecord ScsiShape(TSystemName const& name) {
 }
 
 TMissing WhyNoScsiDevices(std::string const& directory) {
-  if (!fs::exists(directory)) return {kMissingNotGiven, "the kernel shows no SCSI devices: " + directory + " does not exist"};
-  return {kMissingNotGiven, "there are no SCSI devices in " + directory};
+  if (!fs::exists(directory)) return {kMissingNotGiven, "the kernel lists no SCSI devices: " + directory + " does not exist"};
+  return {kMissingNotGiven, "no SCSI devices are listed in " + directory};
 }
 
 }  // namespace NQRVZEP20

@@ -39,7 +39,7 @@ bool AreAll(std::vector<unsigned char> const& bytes, unsigned char value) {
 
 // Bytes in the order in which a UUID is printed.
 TFinding<std::string> UuidFrom(std::vector<unsigned char> const& u) {
-  if (AreAll(u, 0x00)) return TMissing{kMissingNotGiven, "the firmware gives none (all zeros)"};
+  if (AreAll(u, 0x00)) return TMissing{kMissingNotGiven, "not set by the firmware (all zeros)"};
   if (AreAll(u, 0xff)) return TMissing{kMissingNotGiven, "not set by the firmware (all ones)"};
   char text[37];
   std::snprintf(text, sizeof text, "%02X%02X%02X%02X-%02X%02X-%02X%02X-%02X%02X-%02X%02X%02X%02X%02X%02X", u[0], u[1], u[2], u[3],
@@ -227,7 +227,7 @@ TFinding<std::uint16_t> DataWidthFrom(std::uint16_t characteristics) {
 
 // The bytes of the processor's identifier, in their order.
 TFinding<std::string> ProcessorIdFrom(std::vector<unsigned char> const& id) {
-  if (AreAll(id, 0)) return TMissing{kMissingNotGiven, "the firmware gives none (all zeros)"};
+  if (AreAll(id, 0)) return TMissing{kMissingNotGiven, "not set by the firmware (all zeros)"};
   std::string text;
   for (unsigned char byte : id) {
     char digits[3];

@@ -103,7 +103,7 @@ TCIMValue TMofInstances::PathOf(TMofSpan const& alias) {
   if (found == fAliases.end()) throw TMofError(alias, TextAt(alias) + " is not the alias of any instance", kZEPStatusNotFound);
   if (fCreated[found->second].fKeys == kBeingSet)
     throw TMofError(alias, "the keys of " + TextAt(alias) + " depend on themselves");
-  if (fDepth > kMaxKeyDepth) throw TMofError(alias, "keys refer from one instance to the next more than 8 levels deep");
+  if (fDepth > kMaxKeyDepth) throw TMofError(alias, "keys refer to other instances more than 8 levels deep");
   SetKeys(found->second);
   TCIMReference path = fCreated[found->second].fInstance->GetPath(kNone);
   return TCIMValue(path);

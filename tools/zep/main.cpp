@@ -27,17 +27,17 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-constexpr char const* kIsEmpty = " is given but empty";
+constexpr char const* kIsEmpty = " must not be empty";
 
 constexpr TCommand kCommands[] = {
-    {"report", "Report which machine this is", AddReportArguments},
+    {"report", "Report the identity and the hardware of this machine", AddReportArguments},
     {"show", "Print one object or class of the providers' namespaces, or of a MOF file", AddShowArguments},
     {"classes", "List the classes of the providers' namespaces, or of a MOF file", AddClassesArguments},
     {"mof", "Load and check a schema in MOF", AddMofArguments},
     {"media", "List, mount and unmount removable media", AddMediaArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},
     {"remote", "Identify servers through their management controllers", AddRemoteArguments},
-    {"run", "Run a command as the library runs one, and print its output", AddRunArguments},
+    {"run", "Run a command in the same way as the library, and print its output", AddRunArguments},
     {"send", "Send a file to an FTP or SFTP server", AddSendArguments},
     {"get", "Fetch a file from an FTP or SFTP server", AddGetArguments},
     {"proxy-check", "Check whether a web proxy lets requests through", AddProxyCheckArguments},
@@ -130,7 +130,7 @@ std::string WhyNoValue(CLI::App const& chosen, std::string const& message) {
       std::string const type = option->get_type_name();  // "INT:INT in [1 - 1000]"
       return option->get_name() + " takes " + (type.empty() ? "no value" : type.substr(type.find(':') + 1));
     }
-  return "an option does not take its value";
+  return "the value of an option is invalid";
 }
 
 // Messages of CLI11 about values repeat the value, which may be a password; the others name the option or the command.
@@ -233,8 +233,7 @@ void SetSignals() {
 }
 
 int RunOrFail(std::vector<std::string> const& words) {
-  CLI::App app("zep reports what a server knows about itself, through the provider plug-ins in the directory of libzepcore.so.",
-               "zep");
+  CLI::App app("zep reports on this server through the provider plug-ins in the directory of libzepcore.so.", "zep");
   TRuns const runs = AddCommands(app);
   try {
     return Run(app, runs, words);

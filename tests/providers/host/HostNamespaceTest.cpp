@@ -215,7 +215,7 @@ TEST_F(HostNamespaceTest, EveryInstanceIsFoundByItsPath) {
 TEST_F(HostNamespaceTest, EachMissingValueOfAnInstanceHasAReason) {
   FillFromFile(RealTablePath("no-serial"));
   EXPECT_THAT(MissingOf("QRVSG_ComputerSystem."),
-              UnorderedElementsAre("SerialNumber: not given by the firmware", "UUID: the firmware gives none (all zeros)",
+              UnorderedElementsAre("SerialNumber: not given by the firmware", "UUID: not set by the firmware (all zeros)",
                                    "SKUNumber: not given by the firmware", "Family: not given by the firmware"));
 }
 
@@ -328,11 +328,11 @@ TEST_F(HostNamespaceTest, WithoutScsiDevicesTheClassHasAReason) {
   FillFromFile(SamplePath());
   EXPECT_THAT(InstancesOf("QRVSG_SCSIDevice"), IsEmpty());
   EXPECT_THAT(MissingOf("QRVSG_SCSIDevice"),
-              ElementsAre(": the kernel shows no SCSI devices: " + fScsiDevices + " does not exist"));
+              ElementsAre(": the kernel lists no SCSI devices: " + fScsiDevices + " does not exist"));
   fScsiDevices = fDir.Path("scsi");
   TScsiDirectory const empty(fScsiDevices);
   FillFromFile(SamplePath());
-  EXPECT_THAT(MissingOf("QRVSG_SCSIDevice"), ElementsAre(": there are no SCSI devices in " + fScsiDevices));
+  EXPECT_THAT(MissingOf("QRVSG_SCSIDevice"), ElementsAre(": no SCSI devices are listed in " + fScsiDevices));
 }
 
 // ---- The plug-in ----

@@ -83,7 +83,7 @@ TEST(SystemRecordTest, PlaceholdersAndMissingFieldsAreNullWithAReason) {
        {"ProductName", "string NULL not-given: blank in the firmware"},
        {"Version", std::string("string ") + kNoText},
        {"SerialNumber", "string NULL unexpected-form: the firmware refers to string 9, which the structure does not contain"},
-       {"UUID", "string NULL not-given: the firmware gives none (all zeros)"},
+       {"UUID", "string NULL not-given: not set by the firmware (all zeros)"},
        {"SKUNumber", std::string("string ") + kNoText},
        {"Family", std::string("string ") + kNoText}});
 }
@@ -299,7 +299,7 @@ TEST(ProcessorRecordTest, FieldsThatAreUnknownToTheFirmwareAreNull) {
   for (char const* property : {"MaxClockSpeed", "CurrentClockSpeed", "ExternalBusClockSpeed"})
     EXPECT_EQ(PropertyOf(record, property), std::string("uint32 ") + kUnknown) << property;
   EXPECT_EQ(PropertyOf(record, "Role"), std::string("string ") + kUnknown);
-  EXPECT_EQ(PropertyOf(record, "UniqueID"), "string NULL not-given: the firmware gives none (all zeros)");
+  EXPECT_EQ(PropertyOf(record, "UniqueID"), "string NULL not-given: not set by the firmware (all zeros)");
 }
 
 TEST(ProcessorRecordTest, NarrowFieldsMayReferToWideFields) {

@@ -51,7 +51,7 @@ TEST(TMofInstancesTest, KeysThatDependOnThemselvesAreRefused) {
   for (int at = 0; at < 30; ++at)
     chain += "instance of X_N as $N" + std::to_string(at) + " { Next = $N" + std::to_string(at + 1) + "; };\n";
   EXPECT_THAT(ErrorOf(chain + "instance of X_N as $N30 { };"),
-              HasSubstr("keys refer from one instance to the next more than 8 levels deep"));
+              HasSubstr("keys refer to other instances more than 8 levels deep"));
 }
 
 TEST(TMofInstancesTest, AWrongInstanceIsNamed) {

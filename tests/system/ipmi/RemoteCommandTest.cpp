@@ -210,7 +210,7 @@ TEST_F(ZepRemoteTest, EachHostHasATimeLimit) {
   zep::TRun const run = Run({"127.0.0.1", "--timeout", "1"});
   EXPECT_LT(SecondsSince(start), 15);
   EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: 127.0.0.1: not done after 1 s; --timeout allows more\n");
+  EXPECT_EQ(run.errors, "zep: 127.0.0.1: no result after 1 s; --timeout allows more\n");
 }
 
 // The list has controllers that answer, that refuse the account, that are silent, and that cannot be reached.

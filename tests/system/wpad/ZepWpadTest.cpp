@@ -40,7 +40,7 @@ TEST_F(ZepWpadTest, PrintsTheUrlTheMessagesAndTheReplies) {
   EXPECT_EQ(run.output, "http://wpad.test/wpad.dat\n\n" + kTable +
                             "eth0              10.77.0.2         1 x 1472 bytes  300 bytes from 10.77.0.1\n"
                             "                                                    after N ms, with the URL\n");
-  EXPECT_EQ(run.errors, kWillEnd + "  (none runs now)\n");
+  EXPECT_EQ(run.errors, kWillEnd + "  (none is running)\n");
 }
 
 TEST_F(ZepWpadTest, PrintsJson) {
@@ -92,7 +92,7 @@ TEST_F(ZepWpadTest, ListsTheDhcpClientsAndAsksForConfirmation) {
     EXPECT_NE(errors[1].find(" dhclient"), std::string::npos) << errors[1];
     std::string const asked = "Continue? [y/N] ";
     EXPECT_EQ(errors[2].substr(0, asked.size()), asked);
-    std::string const refused = "zep: nothing was done; --yes confirms, and --no-stop leaves the DHCP clients alone";
+    std::string const refused = "zep: nothing was done; --yes confirms, and --no-stop keeps the DHCP clients running";
     EXPECT_EQ(errors[2].substr(asked.size()) == refused, !row.isEnded) << errors[2];
   }
 }
@@ -319,7 +319,7 @@ TEST_F(ZepWpadTest, HelpDescribesTheDhcpClientsAndTheExitStatus) {
   TRun const run = Zep("", "$ZEP wpad --help");
   EXPECT_EQ(run.status, 0);
   EXPECT_NE(run.output.find("the running DHCP clients are ended first"), std::string::npos);
-  EXPECT_NE(run.output.find("Exit status: 0 when there is a URL"), std::string::npos);
+  EXPECT_NE(run.output.find("Exit status: 0 when a URL was found"), std::string::npos);
 }
 
 }  // namespace

@@ -54,7 +54,7 @@ std::string ReasonToIgnore(TSettingLine const& line, std::map<std::string, std::
   if (line.fKey.empty()) return line.fValue.empty() && !line.fHasSeparator ? "an empty line" : "no key before \"=\"";
   if (line.fValue.empty()) return "no value after \"=\"";
   auto const first = lineOfKey.find(std::string(line.fKey));
-  if (first != lineOfKey.end()) return "line " + std::to_string(first->second) + " sets the key, and the first counts";
+  if (first != lineOfKey.end()) return "line " + std::to_string(first->second) + " already sets the key";
   return "";
 }
 
@@ -133,11 +133,11 @@ std::string AsJson(TSettings const& settings, EExitStatus status, std::string co
 // Why there is no setting, or none of that key; empty when there is one.
 std::string WhyNothing(TArguments const& arguments, TSettings const& settings) {
   if (!settings.fSettings.empty()) return "";
-  if (!TOSSpecific::FileExists(kFileName)) return "there is no " + settings.fPath;
+  if (!TOSSpecific::FileExists(kFileName)) return settings.fPath + " does not exist";
   if (TOSSpecific::GetFileSize(kFileName) == 0) return settings.fPath + " is empty";
   if (!std::ifstream(kFileName)) return settings.fPath + " cannot be read";
-  if (settings.fIsCut) return settings.fPath + " cannot be read to its end, so that no setting of it is used";
-  if (!arguments.fKey) return "no line of " + settings.fPath + " is a setting";
+  if (settings.fIsCut) return settings.fPath + " cannot be read to its end, so none of its settings is used";
+  if (!arguments.fKey) return settings.fPath + " contains no setting";
   return settings.fPath + " does not set \"" + *arguments.fKey + "\"";
 }
 
@@ -156,7 +156,7 @@ int Config(TArguments const& arguments) {
 
 TRun AddConfigArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
-  command.add_option("key", arguments->fKey, "Show this setting only, and the ignored lines of its key");
+  command.add_option("key", arguments->fKey, "Show only this setting and the ignored lines with its key");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.footer(
       "The settings are those of the file zep.cfg in the working directory.\n"

@@ -86,18 +86,18 @@ TRun AddGetArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command.add_option("url", arguments->fUrl, "ftp://[USER@]HOST[:PORT]/PATH or sftp://...")->required();
   command.add_option("file", arguments->fFile, "The file to write")->required();
-  CLI::Option* const force = command.add_flag("--force", arguments->fForce, "Overwrite the file without asking");
-  command.add_flag("--no-clobber", arguments->fNoClobber, "Never overwrite an existing file, without asking")->excludes(force);
+  CLI::Option* const force = command.add_flag("--force", arguments->fForce, "Overwrite an existing file without confirmation");
+  command.add_flag("--no-clobber", arguments->fNoClobber, "Never overwrite an existing file")->excludes(force);
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddSizeOption(command, "--max-size", arguments->fOptions.fMostBytes,
-                "The most bytes that are fetched (10 GiB), such as 500K, 2M or 1G; 0: no limit");
+                "The size limit for the file, such as 500K, 2M or 1G (default 10G); 0: no limit");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
-      "An existing file is overwritten only after a question, which is asked on a terminal only. A symbolic link remains, and\n"
+      "An existing file is overwritten only after confirmation, which requires a terminal. A symbolic link remains, and\n"
       "its target is overwritten. Until the download is complete, the file name ends in \".part\". A failed transfer leaves "
       "that\n"
-      "file and a note of its URL and size, \".part.from\". The next transfer continues the file when the server can start in\n"
-      "the middle and reports (FTP: by MDTM) the same time and size at the same URL; otherwise it fetches the file again.\n" +
+      "file and a note of its URL and size, \".part.from\". The next transfer from the same URL continues the file when the\n"
+      "server supports this and reports the same time (FTP: MDTM) and size; otherwise it fetches the file again.\n" +
       TransferHelp());
   return [arguments] { return Get(*arguments); };
 }

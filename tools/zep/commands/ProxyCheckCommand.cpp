@@ -140,12 +140,12 @@ TRun AddProxyCheckArguments(CLI::App& command) {
   command.add_option("proxy", arguments->fProxy, "[USER@]HOST:PORT")->required();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddSizeOption(command, "--max-page", arguments->fMostBytes,
-                "The most bytes of the page that are fetched (1 MiB), such as 500K or 2M; 0: no limit");
+                "The size limit for the page, such as 500K or 2M (default 1M); 0: no limit");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
-      "Fetches a web page through the proxy and checks that this page, not another one, is returned.\n"
+      "Fetches a web page through the proxy and checks that the returned page is the expected one.\n"
       "The password comes from netrc or from a prompt.\n"
-      "Exit status: 0 when the page was returned, 1 when another page or nothing was, 64 for wrong usage, 68 when the proxy\n"
+      "Exit status: 0 when the page was returned, 1 when it was not, 64 for wrong usage, 68 when the proxy\n"
       "is unknown or does not answer, 69 without libcurl, 75 when nothing moved for too long.");
   return [arguments] { return ProxyCheck(*arguments); };
 }

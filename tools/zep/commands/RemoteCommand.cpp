@@ -57,7 +57,7 @@ std::vector<std::string> HostsIn(std::string const& path) {
   }
   bool const isRead = file.is_open() && !file.bad();  // to its end
   if (!isRead) throw std::runtime_error(Printable(path) + " cannot be read: " + std::strerror(errno));
-  if (hosts.empty()) throw std::runtime_error(Printable(path) + " names no host");
+  if (hosts.empty()) throw std::runtime_error(Printable(path) + " contains no host");
   return hosts;
 }
 
@@ -90,10 +90,10 @@ std::string WhyNotPrivate(int file) {
   if (::fstat(file, &status) != 0) return std::strerror(errno);
   if (!S_ISREG(status.st_mode)) return "it is not a regular file";
   if (status.st_uid != ::geteuid()) return "it belongs to another user";
-  if (status.st_nlink != 1) return "it has a second name (a hard link)";
+  if (status.st_nlink != 1) return "it has several names (hard links)";
   if (::fchmod(file, 0600) != 0) return std::strerror(errno);
   bool const isClosed = ::fstat(file, &status) == 0 && (status.st_mode & 0077) == 0;
-  return isClosed ? "" : "its file system lets others read it";
+  return isClosed ? "" : "its file system allows other users to read it";
 }
 
 std::string WhyNotOpened(int error) {
@@ -124,7 +124,7 @@ int AskAll(std::vector<std::string> const& hosts, TAccount const& account, TArgu
       [&](TProcessResult const& result) {
         TRemoteIdentity identity = IdentityFrom(hosts[result.fItem], result.fOutput, result.fIsComplete);
         if (result.fIsTimeUp)
-          identity.fError = "not done after " + std::to_string(arguments.fTimeoutSeconds) + " s; --timeout allows more";
+          identity.fError = "no result after " + std::to_string(arguments.fTimeoutSeconds) + " s; --timeout allows more";
         complete += IsComplete(identity);
         nothing += IsNothing(identity);
         report(identity);
@@ -156,7 +156,7 @@ void HideAfterColon(std::string const& user) {
 
 int Remote(TArguments const& arguments) {
   if (arguments.fHost.empty() == arguments.fHostsFile.empty())
-    throw TWrongUsage("name either a host or a file of hosts (--hosts)");
+    throw TWrongUsage("either a host or a file of hosts (--hosts) is required");
   if (!arguments.fHost.empty() && !IsHostName(arguments.fHost)) throw TWrongUsage("the host is "s + kNoHostName);
   HideAfterColon(arguments.fUser);
   std::vector<std::string> const hosts =
@@ -172,17 +172,17 @@ TRun AddRemoteArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command.add_option("host", arguments->fHost, "The controller's host name or address");
   command.add_option("--hosts", arguments->fHostsFile,
-                     "Query every host that this file names, one per line; print one JSON document per line");
+                     "Query the hosts in this file, one per line, and print one JSON document per line");
   command.add_option("--user", arguments->fUser, "The account on the controllers")->required();
   command.add_option("--password-file", arguments->fPasswordFile, "The file whose first line is the account's password");
-  command.add_option("--parallel", arguments->fParallel, "How many hosts of a file to query at once")
+  command.add_option("--parallel", arguments->fParallel, "The number of hosts to query at the same time")
       ->check(CLI::Range(1, 1000))
       ->capture_default_str();
   command.add_option("--timeout", arguments->fTimeoutSeconds, "The time limit for each host, in seconds")
       ->check(CLI::Range(1, 3600))
       ->capture_default_str();
   command.add_option("--debug-log", arguments->fDebugLog,
-                     "Write the library's log, with debug lines, to this file, which only\nits owner can read");
+                     "Write the library's log, including debug lines, to this file, which only\nits owner can read");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.footer(
       "Queries the management controller of a server for machine type, model and serial number, over IPMI on the LAN (UDP\n"

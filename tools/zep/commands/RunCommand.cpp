@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// zep run: a command, run as the library runs one.
+// zep run: runs a command in the same way as the library.
 
 #include "TOSSpecific.h"
 #include "tools/zep/commands/Commands.h"
@@ -80,14 +80,14 @@ TRun AddRunArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command
       .add_option("--timeout", arguments->fTimeoutSeconds,
-                  "The longest silence allowed, in seconds; -1, the default, waits forever")
+                  "The longest time without output, in seconds; -1, the default, waits forever")
       ->check(CLI::Range(kForEver, std::numeric_limits<int>::max()));
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document, with the output in it");
   command.prefix_command();  // the first word that is not an option begins the command
   command.footer(
       "zep run [OPTIONS] [--] COMMAND [ARGUMENT]...\n"
-      "The output of the command, on standard output and standard error, is printed when it has ended. A zero byte\n"
-      "cuts off the rest of its chunk. Passwords in URLs, and those that zep was given, are printed as ***.\n"
+      "The standard output and standard error of the command are printed after it has ended. A zero byte discards the rest\n"
+      "of the chunk that contains it. Passwords in URLs, and passwords that were given to zep, are printed as ***.\n"
       "Exit status: 0 when the command exited with 0, 1 when it did not, 64 for wrong usage.");
   return [&command, arguments] { return RunCommandLine(command.remaining(), *arguments); };
 }

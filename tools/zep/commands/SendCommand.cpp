@@ -27,7 +27,7 @@ int Send(TArguments const& arguments) {
   std::string const& path = target.fRemote.fPath;
   bool const isNamed = !path.empty() && path.back() != '/';
   if (isNamed && !arguments.fName.empty())
-    throw TWrongUsage("the URL names the file already; --as is for a host or a URL that ends in \"/\"");
+    throw TWrongUsage("the URL already contains the file name; --as needs a host or a URL that ends in \"/\"");
   TInterruptGuard const guard;
   TTransferred const sent = SendFile(arguments.fFile, target, arguments.fName, arguments.fOptions);
   return TellOf(sent, "zep send", arguments.fAsJson, arguments.fOptions);
@@ -41,16 +41,16 @@ TRun AddSendArguments(CLI::App& command) {
   command.add_option("target", arguments->fTarget, "ftp://[USER@]HOST[:PORT]/PATH, sftp://..., or [USER@]HOST[:PORT] alone")
       ->required();
   command.add_option("--as", arguments->fName,
-                     "The name on the server, instead of the file's own, for a host or a URL that ends in \"/\"");
+                     "The name of the file on the server, for a host or a URL that ends in \"/\"; default: the file's own name");
   command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddUploadOptions(command, arguments->fOptions);
   command.footer(
       "Missing directories are created on the server. The file is sent under a temporary name, which ends in a number and\n"
-      "\".part\", and is renamed when the upload is complete. A file or link of that name is then replaced by a new file, a\n"
-      "directory never. The new file has the mode of the replaced one if an SFTP server reports it, otherwise the mode that\n"
-      "the server gives to new files. If the server refuses to rename, the file is sent to its final name directly. On a host\n"
-      "given without a path the file goes to the directory of the user, or, when ZEP_ISBOOTABLE is \"yes\", to\n"
+      "\".part\", and is renamed when the upload is complete. This replaces a file or link of that name, but never a directory.\n"
+      "The new file has the mode of the replaced one if an SFTP server reports it, otherwise the mode that the server gives to\n"
+      "new files. If the server refuses to rename, the file is sent to its final name directly. When only a host is given, the\n"
+      "file goes to the directory of the user or, when ZEP_ISBOOTABLE is \"yes\", to\n"
       "hostline/toqrv/vantor/fdr_upload.\n" +
       TransferHelp() + " 2 when the file changed while it was sent.");
   return [arguments] { return Send(*arguments); };

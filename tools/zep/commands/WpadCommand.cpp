@@ -57,7 +57,7 @@ std::vector<std::string> LinesOf(std::string const& text) {
 void AnnounceStop(std::vector<std::string> const& clients) {
   std::cerr << "This ends the DHCP clients of this machine: every process with \"dhclient\" in its line of \"ps -e\".\n";
   for (std::string const& line : clients) std::cerr << "  " << Printable(line) << "\n";
-  if (clients.empty()) std::cerr << "  (none runs now)\n";
+  if (clients.empty()) std::cerr << "  (none is running)\n";
 }
 
 bool IsConfirmed() {
@@ -209,7 +209,7 @@ int Wpad(TArguments const& arguments) {
   std::string const whyNot = WhyNoListening();
   if (!whyNot.empty()) throw std::runtime_error(whyNot);
   if (!arguments.fKeepsClients && !StopClients(arguments.fIsConfirmed))
-    throw std::runtime_error("nothing was done; --yes confirms, and --no-stop leaves the DHCP clients alone");
+    throw std::runtime_error("nothing was done; --yes confirms, and --no-stop keeps the DHCP clients running");
   TFindings findings{Search(), !arguments.fKeepsClients, {}};
   std::string const& url = findings.fSearch.fUrl;
   if (arguments.fFetches && !url.empty()) findings.fPacFile = FetchPacFile(url, arguments.fMostBytes);
@@ -224,18 +224,18 @@ TRun AddWpadArguments(CLI::App& command) {
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.add_flag("--fetch", arguments->fFetches, "Also fetch the file, over plain HTTP with libcurl, and print it");
   AddSizeOption(command, "--max-file", arguments->fMostBytes,
-                "The most bytes of the file that are fetched (1 MiB), such as 500K or 2M; 0: no limit");
-  auto* const yes = command.add_flag("--yes", arguments->fIsConfirmed, "End the DHCP clients without asking");
+                "The size limit for the file, such as 500K or 2M (default 1M); 0: no limit");
+  auto* const yes = command.add_flag("--yes", arguments->fIsConfirmed, "End the DHCP clients without confirmation");
   command
       .add_flag("--no-stop", arguments->fKeepsClients,
-                "Leave the DHCP clients running; while one holds port 68, no answer can be received")
+                "Keep the DHCP clients running; while one of them uses port 68, no answer can be received")
       ->excludes(yes);
   command.footer(
       "Queries the DHCP server, by a broadcast for each interface whose name begins with \"eth\", for the URL of the proxy\n"
       "configuration file (option 252), and prints it. Only root may listen for the answer, and only one program at a time:\n"
       "the running DHCP clients are ended first. An unanswered query takes 18 seconds: three attempts of six.\n"
-      "Exit status: 0 when there is a URL (with --fetch: and the file), 2 when the file is missing, 1 when there is no URL,\n"
-      "64 for wrong usage.");
+      "Exit status: 0 when a URL was found (with --fetch, the file as well), 2 when the file was not fetched, 1 when no URL\n"
+      "was found, 64 for wrong usage.");
   return [arguments] { return Wpad(*arguments); };
 }
 

@@ -21,9 +21,9 @@ constexpr TReason kReasons[] = {
     {kIpmiClientHostUnknown, "the host name has no address"},
     {kIpmiClientUnreachable, "this system cannot send to the host"},
     {kIpmiClientBusy, "the controller has no free session"},
-    {kIpmiClientRefused, "the account may not be administrator, or there is no common cipher suite"},
+    {kIpmiClientRefused, "the account lacks administrator privilege, or no common cipher suite exists"},
     {kIpmiClientBadArgument, "the user name or the password cannot be used; it may be too long"},
-    {kIpmiClientCompletionCode, "the controller did not carry out a command"},
+    {kIpmiClientCompletionCode, "the controller did not execute a command"},
     {kIpmiClientOutOfMemory, "libipmiClient.so ran out of memory"},
     {kIpmiClientFail, "the controller's answers are invalid"},
 };

@@ -20,13 +20,13 @@ struct TPipe {
 
 TPipe PipeOrThrow() {
   int ends[2];
-  if (::pipe2(ends, O_CLOEXEC) != 0) throw std::system_error(errno, std::generic_category(), "no pipe");
+  if (::pipe2(ends, O_CLOEXEC) != 0) throw std::system_error(errno, std::generic_category(), "a pipe cannot be created");
   return {TUniqueFd(ends[0]), TUniqueFd(ends[1])};
 }
 
 pid_t ForkOrThrow() {
   pid_t const child = ::fork();
-  if (child < 0) throw std::system_error(errno, std::generic_category(), "no process");
+  if (child < 0) throw std::system_error(errno, std::generic_category(), "a process cannot be created");
   return child;
 }
 
@@ -34,7 +34,7 @@ pid_t ForkOrThrow() {
   ::prctl(PR_SET_PDEATHSIG, signalOfOrphan);
   try {
     work([output](std::string_view text) {
-      if (!WriteWhole(output, text)) throw std::system_error(errno, std::generic_category(), "not sent");
+      if (!WriteWhole(output, text)) throw std::system_error(errno, std::generic_category(), "the result cannot be sent");
     });
   } catch (...) {
     ::_exit(1);  // the owner sees that the end is missing

@@ -12,7 +12,8 @@ namespace NQRVZEP20::zep {
 namespace fs = std::filesystem;
 
 TScratchDirectory::TScratchDirectory(std::string const& name) : fPath((fs::temp_directory_path() / (name + ".XXXXXX")).string()) {
-  if (::mkdtemp(fPath.data()) == nullptr) throw std::system_error(errno, std::generic_category(), "no temporary directory");
+  if (::mkdtemp(fPath.data()) == nullptr)
+    throw std::system_error(errno, std::generic_category(), "a temporary directory cannot be created");
 }
 
 TScratchDirectory::~TScratchDirectory() {

@@ -53,7 +53,7 @@ std::string Transfer(TCurlFunctions const& curl, std::string const& url, std::ui
   CURLcode const code = curl.fPerform(handle);
   if (code == CURLE_OK) return "";
   if (page.fIsTooLong) return "it is larger than " + ExactSizeText(mostBytes) + "; --max-file allows more";
-  return error[0] != '\0' ? error.data() : "libcurl ends with code " + std::to_string(code);
+  return error[0] != '\0' ? error.data() : "libcurl failed with code " + std::to_string(code);
 }
 
 bool IsPlainHttp(std::string const& url) { return ::strncasecmp(url.c_str(), "http://", 7) == 0; }

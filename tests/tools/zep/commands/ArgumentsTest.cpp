@@ -117,7 +117,7 @@ TEST_F(ArgumentsTest, EmptyArgumentsAreRefused) {
       {{"get", "ftp://h/f", ""}, "file"},
       {{"proxy-check", ""}, "proxy"},
   };
-  for (TRow const& row : rows) ExpectWrongUsage(row.arguments, row.name + " is given but empty");
+  for (TRow const& row : rows) ExpectWrongUsage(row.arguments, row.name + " must not be empty");
 }
 
 TEST_F(ArgumentsTest, HelpThatCannotBeWrittenIsAFailure) {

@@ -57,7 +57,7 @@ TEST_F(ConfigTest, ShowsTheSettingsWithTheirLinesAndTheIgnoredLinesWithTheReason
                             "Line    Ignored                       Why\n"
                             "1       # comment                     a comment\n"
                             "3                                     an empty line\n"
-                            "6       server=gamma                  line 2 sets the key, and the first counts\n"
+                            "6       server=gamma                  line 2 already sets the key\n"
                             "7       =no key                       no key before \"=\"\n"
                             "8       empty=                        no value after \"=\"\n");
 }
@@ -73,7 +73,7 @@ TEST_F(ConfigTest, ShowsOneSettingAndTheIgnoredLinesOfItsKey) {
                             "2       server                        alpha=beta\n"
                             "\n"
                             "Line    Ignored                       Why\n"
-                            "6       server=gamma                  line 2 sets the key, and the first counts\n");
+                            "6       server=gamma                  line 2 already sets the key\n");
 }
 
 TEST_F(ConfigTest, PrintsJson) {
@@ -86,14 +86,14 @@ TEST_F(ConfigTest, PrintsJson) {
   EXPECT_EQ(document["settings"], nlohmann::json::parse(R"([{"key": "a", "value": "1", "line": 1},
                                                             {"key": "flag", "value": "flag", "line": 3}])"));
   EXPECT_EQ(document["ignored"], nlohmann::json::parse(R"([{"line": 2, "text": "a=2",
-                                                            "reason": "line 1 sets the key, and the first counts"}])"));
+                                                            "reason": "line 1 already sets the key"}])"));
 }
 
 TEST_F(ConfigTest, ReportsWhyThereAreNoSettings) {
   TRun run = Run({});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: there is no " + File() + "\n");
+  EXPECT_EQ(run.errors, "zep: " + File() + " does not exist\n");
 
   Write("");
   run = Run({});
@@ -104,7 +104,7 @@ TEST_F(ConfigTest, ReportsWhyThereAreNoSettings) {
   run = Run({});
   EXPECT_EQ(run.status, 1);
   EXPECT_NE(run.output.find("a comment"), std::string::npos);
-  EXPECT_EQ(run.errors, "zep: no line of " + File() + " is a setting\n");
+  EXPECT_EQ(run.errors, "zep: " + File() + " contains no setting\n");
 
   Write("a=1\n");
   run = Run({"b"});
@@ -137,7 +137,7 @@ TEST_F(ConfigTest, AFileThatCannotBeReadToItsEndIsReportedAsSuch) {
   call.environment = {{"LD_PRELOAD", FAILING_READ}, {"ZEP_TEST_FAILING_FILE", File()}, {"ZEP_TEST_FAILING_BYTE", "50000"}};
   TRun const run = fZep.Run(call);
   EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: " + File() + " cannot be read to its end, so that no setting of it is used\n");
+  EXPECT_EQ(run.errors, "zep: " + File() + " cannot be read to its end, so none of its settings is used\n");
 }
 #endif
 

@@ -175,7 +175,7 @@ TEST_F(MofTest, ASchemaWithoutClassesIsAnError) {
   TRun const run = Run({"classes", "--mof", "empty.mof"});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: there is no class\n");
+  EXPECT_EQ(run.errors, "zep: no class was found\n");
 }
 
 // ---- zep show ----

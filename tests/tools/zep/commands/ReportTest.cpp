@@ -141,7 +141,7 @@ TEST_F(ReportTest, EachRowHasItsValueOrItsReason) {
       {"full", "zepcore version", TEST_VERSION},
       {"full", "zepcore build", TEST_BUILD_ID},
       {"full", "Manufacturer", "Example Works"},
-      {"full", "UUID", "unknown: the firmware gives none (all zeros)"},
+      {"full", "UUID", "unknown: not set by the firmware (all zeros)"},
       {"full", "BIOS version", "-[ABE123CUS-1.10]-"},
       {"full", "BIOS date", "unknown: not given by the firmware"},
       {"full", "Chassis", "Other"},

@@ -115,7 +115,7 @@ TEST_F(ShowTest, AMissingValueHasAReason) {
   TRun const run = Run({"show",
                         "CIM_Processor.CreationClassName=\"CIM_Processor\",DeviceID=\"Processor 0\","
                         "SystemCreationClassName=\"QRVSG_ComputerSystem\",SystemName=\"db1\""});
-  EXPECT_THAT(run.output, HasSubstr("UniqueID                  string      NULL: the firmware gives none (all zeros)\n"));
+  EXPECT_THAT(run.output, HasSubstr("UniqueID                  string      NULL: not set by the firmware (all zeros)\n"));
 }
 
 TEST_F(ShowTest, AClassIsShownWithInheritedPropertiesAndItsInstances) {

@@ -150,7 +150,7 @@ TEST_F(ZepRemoteTest, AFileOfHostsThatCannotBeUsedIsReported) {
   TRun const without = Run({"--hosts", absent, "--user", "u"}, fPassword);
   EXPECT_EQ(without.status, 1);
   EXPECT_EQ(without.errors, "zep: " + absent + " cannot be read: No such file or directory\n");
-  EXPECT_EQ(Run({"--hosts", empty, "--user", "u"}, fPassword).errors, "zep: " + empty + " names no host\n");
+  EXPECT_EQ(Run({"--hosts", empty, "--user", "u"}, fPassword).errors, "zep: " + empty + " contains no host\n");
 }
 
 TEST_F(ZepRemoteTest, AReadErrorInTheFileOfHostsIsNotTheEndOfTheFile) {
@@ -209,7 +209,7 @@ TEST_F(ZepRemoteTest, ADebugLogMustBeARegularFileOfTheCaller) {
   struct TRow {
     std::string log, reason;
   };
-  for (TRow const& row : {TRow{link, "it is a symbolic link"}, TRow{fZep.Path("second"), "it has a second name (a hard link)"},
+  for (TRow const& row : {TRow{link, "it is a symbolic link"}, TRow{fZep.Path("second"), "it has several names (hard links)"},
                           TRow{fifo, "it is not a regular file"}, TRow{"/dev/null", "it is not a regular file"}}) {
     TRun const run = Run({"host", "--user", "u", "--debug-log", row.log}, fPassword);
     EXPECT_EQ(run.status, 1);
@@ -341,10 +341,10 @@ TEST_F(ZepRemoteTest, EachErrorOfTheClientLibraryHasItsReason) {
       {"4", "the host name has no address"},
       {"5", "this system cannot send to the host"},
       {"6", "the controller has no free session"},
-      {"7", "the account may not be administrator, or there is no common cipher suite"},
+      {"7", "the account lacks administrator privilege, or no common cipher suite exists"},
       {"8", "the user name or the password cannot be used; it may be too long"},
       {"9", "error 9 of libipmiClient.so"},
-      {"10", "the controller did not carry out a command"},
+      {"10", "the controller did not execute a command"},
       {"11", "libipmiClient.so ran out of memory"},
       {"12", "the controller's answers are invalid"},
       {"15", "error 15 of libipmiClient.so"},

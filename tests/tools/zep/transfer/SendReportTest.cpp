@@ -47,7 +47,7 @@ TEST(SendReportTest, IsKeptAlsoWhenSendingThrows) {
   EXPECT_EQ(sent.fTransferred.fOutcome.fExit, kExitNothing);
   EXPECT_THAT(sent.fKeptIn, testing::StartsWith(dir.Path()));
   EXPECT_EQ(testing::internal::GetCapturedStderr(),
-            "zep: no pipe: Too many open files\nzep: the report is kept in " + sent.fKeptIn + "\n");
+            "zep: a pipe cannot be created: Too many open files\nzep: the report is kept in " + sent.fKeptIn + "\n");
   EXPECT_EQ(ReadFile(sent.fKeptIn), Gzipped(AsText(ReportAsJson(report))));
 }
 
