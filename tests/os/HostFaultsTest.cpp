@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Every call of the C library that a host service makes fails in turn (tests/os/faults). The operation must report the right
-// result, leak nothing, and end.
+// Makes every call that a host service makes to the C library fail, one after the other (tests/os/faults). The operation must
+// report the correct result, leak nothing, and end.
 
 #include "tests/os/HostTools.h"
 #include "tests/os/Programs.h"
@@ -30,7 +30,7 @@ TOutcome Do(std::string const& operation, std::string const& fault = "") {
   fs::create_directories(dir.Path("tree/below"));
   WriteFile(dir.Path("tree/below/file"), "text");
   fs::create_directories(dir.Path("bin"));
-  for (char const* command : {"bin/cp", "bin/vi"}) {  // which do nothing
+  for (char const* command : {"bin/cp", "bin/vi"}) {  // stand-ins that do nothing
     WriteFile(dir.Path(command), "#!/bin/sh\n");
     fs::permissions(dir.Path(command), fs::perms::all);
   }
@@ -55,14 +55,14 @@ TOutcome Do(std::string const& operation, std::string const& fault = "") {
 
 struct TFault {
   std::string function;  // "child." for a child before its exec
-  std::string number;    // which call, or "all"
-  int error;             // for write also 0 (nothing written) and -1 (half)
+  std::string number;    // the number of the call, or "all"
+  int error;             // an errno; for write also 0 (nothing is written) and -1 (half is written)
   TLines lines;
 };
 
 struct TOperation {
   std::string name;
-  TLines lines;  // without a fault
+  TLines lines;  // the result without a fault
   std::vector<TFault> faults;
 };
 
@@ -70,8 +70,8 @@ void PrintTo(TOperation const& operation, std::ostream* stream) { *stream << ope
 
 std::string const kChild = Child("PrintsArguments");
 
-// The results of starting, reading and waiting for a child, in every operation that does so. Each names its own result when
-// the child ran as it should, when it was left or failed after its output was read, and before.
+// The faults of starting, reading and waiting for a child, for every operation that does so. Each operation gives its results
+// for a successful child, for one that is left or fails after its output was read, and for one that fails before.
 std::vector<TFault> SpawnFaults(TLines const& log, std::string const& good, std::string const& badWithOutput,
                                 std::string const& badWithout, std::string const& goodWithout) {
   auto const with = [&log](std::string const& result, TLines const& more = {}) {
@@ -86,7 +86,7 @@ std::vector<TFault> SpawnFaults(TLines const& log, std::string const& good, std:
       {"close", "all", EINTR, with(good)},
       {"select", "1", EINTR, with(badWithout, {"[Debug] ERROR: SpawnProcess - select call failed!", "a child left"})},
       {"select", "2", EINTR, with(badWithOutput, {"[Debug] ERROR: SpawnProcess - select call failed!", "a child left"})},
-      {"read", "all", EINTR, with(good)},  // appends nothing, and the next one reads
+      {"read", "all", EINTR, with(good)},  // appends nothing; the next read succeeds
       {"waitpid", "1", ECHILD, with(badWithOutput, {"[Debug] ERROR: SpawnProcess - waitpid call failed!", "a child left"})},
       {"child.close", "all", EINTR, with(good)},
       {"child.dup2", "1", EINTR, with(goodWithout)},  // its output goes nowhere
@@ -205,28 +205,28 @@ std::vector<TOperation> Operations() {
         {"read", "2", EIO, {fileError + ", 0123456789"}},
         {"write", "1", ENOSPC, {fileError}},
         {"write", "1", 0, {"copied"}},          // a write of nothing ends the copy, and its result is 0
-        {"write", "1", -1, {"copied, 01234"}},  // a short write is not made up for
+        {"write", "1", -1, {"copied, 01234"}},  // a short write is not continued
         {"close", "all", EIO, {"copied, 0123456789"}}}},
       {"FileCopyOfALargeFile",
        {"copied, all"},
        {{"stat", "1", EACCES, {fileError + ", not all"}},
         {"open", "all", EACCES, {fileError + ", not all"}},
-        {"copy_file_range", "all", EXDEV, {"copied, all"}},  // whatever the kernel did not copy is read and written
+        {"copy_file_range", "all", EXDEV, {"copied, all"}},  // data that the kernel cannot copy are read and written
         {"read", "all", EIO, {fileError + ", all"}},
         {"lseek", "all", EIO, {fileError + ", all"}},
-        {"write", "1", ENOSPC, {fileError + ", all"}},  // of the last chunk, which is written once more
+        {"write", "1", ENOSPC, {fileError + ", all"}},  // the last chunk, which is written again
         {"close", "all", EIO, {"copied, all"}}}},
       {"DirCopy",
        {"0, text"},
        {{"opendir", "all", EMFILE, {fileError}},
-        {"stat", "1", EIO, {"0, text"}},  // the check whether the destination exists: it is then made
+        {"stat", "1", EIO, {"0, text"}},  // the check whether the destination exists; the destination is then created
         {"stat", "2", EIO, {"0"}},        // the directory in the source: passed over
         {"stat", "3", EIO, {"0, text"}},
-        {"stat", "4", EIO, {"0"}},        // the file in that directory: passed over
+        {"stat", "4", EIO, {"0"}},        // the file in that directory, which is skipped
         {"stat", "5", EIO, {fileError}},  // FileCopy's own
         {"mkdir", "1", EACCES, {"threw kZEPStatusAccessDenied"}},
         {"mkdir", "2", ENOSPC, {fileError}},
-        {"readdir", "1", EIO, {"0"}},  // as at its end
+        {"readdir", "1", EIO, {"0"}},  // treated as the end of the directory
         {"open", "all", EMFILE, {fileError}},
         {"read", "1", EIO, {fileError}},
         {"write", "1", ENOSPC, {fileError}},
@@ -235,7 +235,7 @@ std::vector<TOperation> Operations() {
         {"closedir", "2", EIO, {"-1, text"}}}},
       {"MkDirHier",
        {"made, there"},
-       {{"stat", "all", ENOENT, {"made, there"}},  // as if another thread made each directory just after it was missed
+       {{"stat", "all", ENOENT, {"made, there"}},  // as if another thread created each directory immediately after the check
         {"mkdir", "1", EEXIST, {"threw kZEPStatusDirectoryAlreadyExists, missing"}},
         {"mkdir", "1", EACCES, {"threw kZEPStatusAccessDenied, missing"}}}},
       {"ListDir",
@@ -294,7 +294,7 @@ std::vector<TOperation> Operations() {
          "3",
          EMFILE,
          {"threw kZEPStatusAccessDenied, first ", "[Error] TOSSpecific|CurlTransferFile: Error performing command: "}},
-        {"fclose",  // a disk that is full only then
+        {"fclose",  // a full disk that is detected only then
          "1",
          ENOSPC,
          {"threw kZEPStatusAccessDenied, first ", "[Error] TOSSpecific|CurlTransferFile: Error performing command: "}},
@@ -319,7 +319,7 @@ std::vector<TOperation> Operations() {
        {{"stat", "all", EACCES, {"b", parsing, parsing, missing}},
         {"fopen64", "1", EACCES, {"b", parsing, parsing}},
         {"fclose", "1", EIO, {"a,b", parsing, parsing}},
-        {"read", "all", EIO, {"b", parsing, parsing, readingFailed}}}},  // the former settings stay
+        {"read", "all", EIO, {"b", parsing, parsing, readingFailed}}}},  // the previous settings are kept
   };
 }
 
@@ -335,7 +335,7 @@ TEST_P(HostFaultsTest, EveryCallFailsInTurn) {
     untried.erase(fault.function);
     int const calls = clean.calls.count(fault.function) ? clean.calls.at(fault.function) : 0;
     EXPECT_TRUE(calls > 0 || kIsSanitized) << fault.function << " is not called";
-    // Of many calls with the same outcome, the first, the second and the last are enough.
+    // Of many calls with the same result, only the first, the second and the last are made to fail.
     for (int number = 1; number <= calls; ++number) {
       if (fault.number == "all" ? number > 2 && number < calls : fault.number != std::to_string(number)) continue;
       std::string const name = fault.function + ":" + std::to_string(number) + ":" + std::to_string(fault.error);

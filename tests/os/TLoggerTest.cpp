@@ -31,7 +31,7 @@ std::string const kCloseBanner = "-- ZEP Log Closed ----------------------------
 
 ILogger::EZEPLogSeverity Severity(int value) { return static_cast<ILogger::EZEPLogSeverity>(value); }
 
-// How many descriptors of this process name that file.
+// The number of this process's descriptors that refer to that file.
 int DescriptorsOf(std::string const& path) {
   int count = 0;
   for (auto const& entry : std::filesystem::directory_iterator("/proc/self/fd")) {
@@ -52,7 +52,7 @@ protected:
 
   std::string Path(std::string const& name) const { return fDir.Path(name); }
 
-  // The text that one entry writes to a new log file, at a threshold that filters nothing and at that time.
+  // Returns the text that one entry writes to a new log file at that time, with a threshold that filters nothing.
   std::string WrittenAt(TFakeClock::TTime const& time, ILogger::EZEPLogSeverity severity, std::string const& message) {
     TFakeClock const clock({time});
     TLogger::SetLogThreshold(ILogger::kLogVerbose);
@@ -188,7 +188,7 @@ TEST_F(TLoggerTest, AThreadLocalObjectMayLogAtTheEndOfAThread) {
 }
 
 TEST_F(TLoggerTest, ALogEntryAfterTheEndOfTheLoggerGetsANewOneWithoutAFile) {
-  TLogger::GetInstance();  // the logger's own key is made first, and so ends first
+  TLogger::GetInstance();  // the logger's own key is created first and therefore destroyed first
   pthread_key_t key;
   ASSERT_EQ(::pthread_key_create(&key, [](void*) { TLogsAtTheEnd(); }), 0);
   OnNewThread([this, key] {

@@ -122,7 +122,7 @@ TEST_F(TOSSpecificMachineTest, KeysAreComparedCaseSensitively) {
 TEST_F(TOSSpecificMachineTest, AStructureOfMoreThan1024BytesIsReadUpToThere) {
   std::string const fields = "\0\2\0\3"s;
   std::size_t const room = 1024 - 4 - fields.size();
-  // The product name's zero is the last byte but two of the buffer, or the last but one.
+  // The zero of the product name is the third-last or the second-last byte of the buffer.
   for (std::size_t spare : {2, 1}) {
     SCOPED_TRACE(spare);
     std::string const product = "1234AB7";
@@ -357,7 +357,7 @@ struct TProbeRun {
 
 class SmbiosStandInTest : public testing::Test {
 protected:
-  // Runs the operation in a process whose loader looks in `libraryDir` first and then in `coreDir`.
+  // Runs the operation in a process whose loader searches `libraryDir` first and then `coreDir`.
   TProbeRun Run(std::string const& operation, std::string const& environment = "",
                 std::string const& libraryDir = ZEP_STANDIN_DIR "/whole", std::string const& coreDir = ZEP_BUILD_DIR "/lib") {
     std::string const record = fDir.Path("record");

@@ -120,7 +120,7 @@ TEST(UnmountDeviceTest, AnyResultButZeroThrows) {
 
 class StandInTest : public testing::Test {
 protected:
-  // A shell script that records its call, and then does what the test wants.
+  // Adds a shell script that records its call and then runs the test's commands.
   void Add(std::string const& name, std::string const& body) {
     WriteFile(fDir.Path(name), "#!/bin/sh\necho \"" + name + " $*\" >> " + fDir.Path("calls") + "\n" + body + "\n");
     fs::permissions(fDir.Path(name), fs::perms::all);
@@ -182,7 +182,7 @@ TEST_F(StandInTest, ErrorMessagesOfTheCommandsAreSuppressed) {
     EXPECT_STATUS(TOSSpecific::MountDevice("/dev/sdb"), kZEPStatusFileSystemError);
     return ReadFile(fDir.Path("seen/errors"));
   });
-  // Only that of listing the mounts is not redirected. Kept.
+  // Only the output of listing the mounts is not redirected. Kept.
   EXPECT_EQ(seen, "complaint\n");
 }
 
@@ -316,7 +316,7 @@ private:
   TFakeClass& fClass;
 };
 
-// For use in a child: covers the paths that are read with empty file systems of the child's own.
+// For use in a child: covers the paths that are read with empty file systems, which only the child sees.
 class TFakeMachine {
 public:
   TFakeMachine() {
@@ -534,7 +534,7 @@ TEST(EnumerateRemovableMediaTest, OnlyADiskInTheListIsAUsbDisk) {
   };
   TRow const rows[] = {
       {"2/2", list, true},
-      {"2/3", list, false},  // it came after the list was read
+      {"2/3", list, false},  // it appeared after the list was read
       {"3/2", list, false},
       {"", list, false},
       {"", list + "USB", false},

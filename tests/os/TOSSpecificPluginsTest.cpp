@@ -186,7 +186,7 @@ protected:
   // Copies a plug-in of the test tree into the root path.
   void Install(std::string const& file) { fs::copy_file(kPlugins + file, fDir.Path(file)); }
 
-  // The output of the program that uses the core library of that directory.
+  // Returns the output of the program, which uses the core library in that directory.
   static std::vector<std::string> Probe(std::string const& directory, std::string const& arguments) {
     TProgramRun const run = RunProgram("LD_LIBRARY_PATH='" + directory + "' " + kProbe + " " + arguments);
     EXPECT_EQ(run.exitCode, 0);
@@ -290,7 +290,7 @@ TEST_F(RootPathTest, WithoutTheIpmiClientNoControllerAnswers) {
 }
 
 TEST_F(RootPathTest, AnIpmiClientInstalledLaterIsLoadedThen) {
-  if (kIsSanitized) GTEST_SKIP() << "not with a sanitizer, whose dlopen looks where the program does: beside the real client";
+  if (kIsSanitized) GTEST_SKIP() << "the dlopen of a sanitizer searches the program's directories, which contain the real client";
   EXPECT_THAT(Probe("controller '' " ZEP_IPMI_STANDINS "/whole/libipmiClient.so"),
               ElementsAre("[]", "not connected", testing::_, "connected"));
 }

@@ -114,7 +114,7 @@ TEST_F(SpawnProcessTest, ZeroByteCutsOffTheRestOfItsChunk) {
   EXPECT_EQ(RunChild("PrintsZeroByteAmongMany").output, std::string(100 + 4095 + 1810, 'x'));
 }
 
-// While it lives, standard input is a pipe into which nothing but this text comes, and which has no end before End.
+// Replaces standard input with a pipe that contains only this text, and whose end is not reached before End.
 class TTypedInput {
 public:
   explicit TTypedInput(std::string const& text = "") : fOld(::fcntl(0, F_DUPFD_CLOEXEC, 3)) {
@@ -326,14 +326,14 @@ TEST_F(SpawnProcessTest, AnyOtherNegativeTimeoutIsAFailureOfSelect) {
       LogOf([&] { run = RunChild("PrintsNothing", {}, -2); }),
       (TEntries{"[Debug] SpawnProcess: process " + Child("PrintsNothing"), "[Debug] ERROR: SpawnProcess - select call failed!"}));
   EXPECT_EQ(run.result, -1);
-  EXPECT_GT(::wait(nullptr), 0);  // nor is it waited for
+  EXPECT_GT(::wait(nullptr), 0);  // it has not been waited for
 }
 
 // ---- Signals ----
 
 void Ignored(int) {}
 
-// Handles SIGUSR1 in that way; afterwards as before.
+// Handles SIGUSR1 in that way until it is destroyed.
 class TSignalAction {
 public:
   explicit TSignalAction(void (*handler)(int), int number = SIGUSR1) : fNumber(number) {
@@ -408,7 +408,7 @@ TEST_F(SpawnProcessTest, AChildThatCannotBeWaitedForIsAFailureOfWaitpid) {
 
 // ---- Descriptors ----
 
-// The descriptors of this process above standard error that exec leaves open, as PrintsDescriptors prints its own.
+// The descriptors of this process above standard error that remain open after exec, in the format of PrintsDescriptors.
 std::string InheritableDescriptors() {
   std::map<int, std::string> names;
   for (auto const& entry : std::filesystem::directory_iterator("/proc/self/fd")) {
@@ -449,8 +449,8 @@ TEST_F(SpawnProcessTest, PipeOfAnotherThreadIsNotInherited) {
   EXPECT_EQ(descriptors, before);
 }
 
-// Children that wait for the end of their input start while others run that end at once. One of these would stay silent, and
-// end as timed out, if one of those had its pipe.
+// Some children wait for the end of their input; others, started meanwhile, end immediately. If a waiting child held the pipe of
+// another one, that one would time out.
 TEST_F(SpawnProcessTest, NoChildWaitsForThatOfAnotherThread) {
   constexpr int kWaiting = 100, kTimeoutSeconds = 40;
   TTypedInput input;
@@ -551,7 +551,7 @@ TEST_F(SpawnProcessTest, LeavesNoDescriptorOpen) {
 // ---- The start of the child ----
 
 TEST_F(SpawnProcessTest, WhereNoProcessCanBeMadeItThrows) {
-  // In a child, as a user that may have no further process.
+  // Runs in a child, as a user who may create no further process.
   auto const spawnWithoutProcesses = [](auto spawn) {
     return InChild([&] {
       TLogger::GetInstance()->ClearLog();

@@ -64,7 +64,7 @@ TLines Joined(TLines a, TLines const& b, TLines const& c) {
   return a;
 }
 
-// Expects that the work throws that reason, and that the line that it logs consists of the operation's name and the reason.
+// Expects that the work throws a failure with that reason and logs the name of the operation and the reason as one line.
 void ExpectReason(std::function<void()> const& work, std::string const& operation, std::string const& reason) {
   EXPECT_THAT(LogOf([&] { EXPECT_EQ(ReasonOf(work), reason); }), ElementsAre("[Error] " + operation + reason));
 }
@@ -122,7 +122,7 @@ struct TRefusal {
   char const* lastCall;
 };
 
-// Everything ends at the refused option: checks the log, the last call, and that all was released.
+// Expects that the operation ends at the refused option: checks the log, the last call, and that everything was released.
 void ExpectRefusals(std::vector<TRefusal> const& rows, std::function<void()> const& operation) {
   for (TRefusal const& row : rows) {
     SCOPED_TRACE(row.message);
@@ -276,7 +276,7 @@ TEST_F(TransferTest, EachOfTheSixFunctionsIsNeeded) {
   }
 }
 
-// The core library, and the copies of libcurl that the linker may find beside it and elsewhere.
+// Directories with the core library and with the copies of libcurl that the linker may find beside it and elsewhere.
 class LoadingCurlTest : public testing::Test {
 protected:
   LoadingCurlTest() {
@@ -290,7 +290,7 @@ protected:
   std::string Root(std::string const& name) const { return fDir.Path("root/" + name); }
   std::string System(std::string const& name) const { return fDir.Path("system/" + name); }
 
-  // A file in the loader's way: it finds that one, fails, and looks no further for the name.
+  // A file that is not a library: the loader finds it first, fails, and does not continue its search for the name.
   static void Spoil(std::string const& path) { WriteFile(path, ""); }
 
   TProgramRun Probe(std::string const& arguments = "") const {
@@ -344,7 +344,7 @@ TEST_F(LoadingCurlTest, WithoutOneEachCallTriesEveryNameAgain) {
       "TOSSpecific|CheckProxySetting: Error opening curl library: "
       "libcurl.so.2: cannot open shared object file: No such file or directory\n";
   EXPECT_EQ(Probe("--proxy").output, ofProxy + ofProxy);
-  // One that comes between the two calls is found by the second.
+  // A library that is added between the two calls is found by the second call.
   std::string const late = Root("libcurl.so.4");
   EXPECT_EQ(Probe(kStandIn + " " + late).output, failure + late + "\ndone\n");
 }
@@ -481,7 +481,7 @@ TEST_F(TransferTest, ALocalFileIsOverwrittenWhenTheAnswerIsY) {
 }
 
 TEST_F(TransferTest, ALocalFileThatCannotBeDeletedEndsQuietly) {
-  // A directory opens for reading and is nothing that can be unlinked, not even by root.
+  // A directory can be opened for reading, but not unlinked, not even by root.
   fs::create_directory(fFile);
   EXPECT_EQ(DownloadOnto(fFile, "y\n", fDir), kQuestion + "Permission denied.\n" + kQuietEnd);
   EXPECT_TRUE(fs::is_directory(fFile));
