@@ -19,9 +19,6 @@ find_program(ZEP_CCACHE ccache)
 if(ZEP_CCACHE)
   set(CMAKE_CXX_COMPILER_LAUNCHER ${ZEP_CCACHE})
 endif()
-if(ZEP_TIDY)
-  set(CMAKE_CXX_CLANG_TIDY clang-tidy)
-endif()
 
 # The build tree resembles the installed one: libraries loaded at run time share a directory; test plug-ins are elsewhere.
 set(ZEP_LIB_DIR ${PROJECT_BINARY_DIR}/lib)

@@ -37,13 +37,19 @@ need_packages() {
   "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive apt-get install -y -qq --no-install-recommends "${missing[@]}" >/dev/null
 }
 
-# Configures and builds a preset: build PRESET [TARGET...]. When `with_tests` is OFF, the tests are not built, which needs fewer
-# packages.
+# Configures a preset: configure PRESET. The output goes to build/PRESET/configure.log, and is printed when that fails. When
+# `with_tests` is OFF, the tests are not built, which needs fewer packages.
 with_tests=ON
+configure() {
+  local log=build/$1/configure.log
+  mkdir -p "$(dirname "$log")"
+  cmake --preset "$1" -DZEP_BUILD_TESTS="$with_tests" >"$log" 2>&1 || { cat "$log"; return 1; }
+}
+
+# Configures and builds a preset: build PRESET [TARGET...].
 build() {
   local preset=$1
   shift
-  cmake --preset "$preset" -DZEP_BUILD_TESTS="$with_tests" >build-configure.log 2>&1 || { cat build-configure.log; rm -f build-configure.log; return 1; }
-  rm -f build-configure.log
+  configure "$preset" || return
   cmake --build --preset "$preset" ${1:+--target "$@"}
 }
