@@ -53,7 +53,7 @@ public:
   TMissing WhyNoInstance(std::string const& className) const;
 
   // The value of a property, with its CIM type: numbers stay numbers.
-  TAnswer<TCIMValue> Answer(ICIMInstance const& instance, std::string const& property) const;
+  TAnswer<TCIMValue> Answer(ICIMInstance const& instance, std::string const& name) const;
 
   // The same for a property of the first instance of the class. When there is none, the reason is the class's.
   TAnswer<TCIMValue> AnswerOfFirst(std::string const& className, std::string const& property) const;

@@ -51,7 +51,7 @@ void ExpectSame(bool checked, bool expected) {
 extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
   if (size < 6) return 0;
   // The first byte of the input is the length position, the rest is the packet.
-  int const lengthPosition = static_cast<signed char>(data[0]);
+  int const lengthPosition = static_cast<signed char>(data[0]);  // NOLINT(bugprone-signed-char-misuse): may be negative
   std::vector<char> packet(data + 1, data + size);
   std::ptrdiff_t const lengthPlace = lengthPosition - (packet[4] == 0 ? 16 : 0);
   FitArea(packet, lengthPlace);

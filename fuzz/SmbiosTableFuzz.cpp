@@ -17,6 +17,7 @@
 #include <array>
 #include <cstdint>
 #include <string>
+#include <vector>
 
 namespace {
 
@@ -51,10 +52,10 @@ void ReadIdentity(std::string_view structure) {
 void ReadBiosVersion(std::string_view structure) {
   if (structure.size() < 6) return;
   std::string set(structure.substr(4));
-  std::string output(set.size(), '\0');
+  std::vector<char> output(set.size() + 1);
   int const found = TOSSpecific::getBIDString(set.data(), output.data(), static_cast<int>(set.size()), structure[5]);
   Require(found == 0 || found == 1);
-  CleanBiosVersion(output.c_str());
+  CleanBiosVersion(output.data());
 }
 
 // A file in memory that the library can open by name.

@@ -34,6 +34,7 @@ template <class TStored, class TRead = TStored>
 void CompareWithStream(TType type, std::string& text) {
   auto const expected = static_cast<TStored>(Extracted<TRead>(text));
   auto const actual = TCIMValue(type, text, nullptr).operator TStored();
+  // NOLINTNEXTLINE(bugprone-suspicious-memory-comparison): also the sign of zero must be the same
   Require(std::memcmp(&expected, &actual, sizeof expected) == 0);
 }
 
@@ -64,7 +65,7 @@ void TryEachType(std::string& text) {
   for (int type = TType::kCIMTypeInvalid; type <= TType::kCIMTypeArrayFlag + 1; ++type) {
     try {
       TCIMValue const value(TType(TType::ECIMType(type)), text, nullptr);
-      TCIMValue const copy(value);
+      TCIMValue const copy(value);  // NOLINT(performance-unnecessary-copy-initialization): the copy is the subject
       Require(copy.GetType() == type && !copy.IsNull());
       Require(copy.ToString() == value.ToString());
       Require(copy == value && !(copy != value));

@@ -83,8 +83,8 @@ public:
 
 private:
   std::string fLogFilename;  // set before the file is opened, and also when opening fails
-  std::FILE* fLogFile;
-  bool fInitialized;
+  std::FILE* fLogFile = nullptr;
+  bool fInitialized = false;
 
   static EZEPLogSeverity fThreshold;
   static std::list<TLogEntry> fLogEntries;

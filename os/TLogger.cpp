@@ -172,7 +172,7 @@ TLogger* TLogger::GetInstance() {
   return tInstance;
 }
 
-TLogger::TLogger() : fLogFile(nullptr), fInitialized(false) {}
+TLogger::TLogger() = default;
 
 TLogger::~TLogger() {
   if (fLogFile == nullptr) return;

@@ -87,7 +87,7 @@ std::vector<std::string> TOSSpecific::ListDir(std::string path) {
   TUniqueDir const dir = OpenDirOrThrow(path);
   std::vector<std::string> names;
   while (dirent const* const entry = ::readdir(dir.get()))
-    if (!IsDotOrDotDot(entry->d_name)) names.push_back(entry->d_name);
+    if (!IsDotOrDotDot(entry->d_name)) names.emplace_back(entry->d_name);
   return names;
 }
 

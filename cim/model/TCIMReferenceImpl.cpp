@@ -230,7 +230,7 @@ void TCIMReferenceImpl::AddKey(std::string&& name, TCIMValue&& value) {
 }
 
 void TCIMReferenceImpl::EnumerateKeyBindings(boost::function<bool(std::pair<std::string, TCIMValue>)> callback) const {
-  for (std::size_t i = 0; i < fKeys.size(); ++i)  // the callback may add keys
+  for (std::size_t i = 0; i < fKeys.size(); ++i)  // NOLINT(modernize-loop-convert): the callback may add keys
     if (!callback(fKeys[i])) return;
 }
 

@@ -76,7 +76,7 @@ TLink::TLink(TAddress const& address) : fAddress(address), fSocket(UnconnectedSo
 void TLink::Send(TPacket const& packet) {
   // A refusal of an earlier packet is reported by the next call, which then does nothing else: hence the second one.
   for (int attempt = 0; attempt < 2; ++attempt) {
-    auto const address = reinterpret_cast<sockaddr const*>(&fAddress.address);
+    auto const* const address = reinterpret_cast<sockaddr const*>(&fAddress.address);
     if (::sendto(fSocket.get(), packet.data(), packet.size(), MSG_NOSIGNAL, address, fAddress.size) >= 0) return;
     if (errno == ECONNREFUSED) fIsRefused = true;
   }

@@ -46,7 +46,7 @@ std::unique_ptr<IEnvelope> OpenInStep(TOpening const& opening, TWay const& way) 
 
 }  // namespace
 
-TSession::TSession(TTarget target, TTimes const& times) : fTarget(std::move(target)), fTimes(times) {
+TSession::TSession(TTarget const& target, TTimes const& times) : fTarget(target), fTimes(times) {
   if (fTarget.user.size() > kMaxUserLength || fTarget.password.size() > kMaxPasswordLength)
     throw TFailure{kIpmiClientBadArgument};
 }

@@ -26,7 +26,7 @@ struct TTimes {
 // A session with a controller, as administrator. Closed when it goes out of scope. Its functions throw TFailure.
 class TSession {
 public:
-  explicit TSession(TTarget target, TTimes const& times = {});
+  explicit TSession(TTarget const& target, TTimes const& times = {});
   ~TSession();
   TSession(TSession const&) = delete;
   TSession& operator=(TSession const&) = delete;

@@ -18,6 +18,7 @@ namespace NQRVZEP20 {
 template <class TElement, class TCallback>
 bool VisitEach(std::vector<boost::shared_ptr<TElement>> const& elements, TCallback const& callback) {
   for (std::size_t i = 0; i < elements.size(); ++i) {
+    // NOLINTNEXTLINE(performance-unnecessary-copy-initialization): the callback may remove the element
     boost::shared_ptr<TElement> const element = elements[i];
     if (!callback(element)) return false;
   }

@@ -41,11 +41,11 @@ std::unique_ptr<char[]> Packed(std::vector<std::string> const& strings) {
   for (std::string const& text : strings) size += sizeof(TLength) + text.size();
   std::unique_ptr<char[]> packed(new char[size]);
   char* at = packed.get();
-  TLength const count = static_cast<TLength>(strings.size());
+  auto const count = static_cast<TLength>(strings.size());
   std::memcpy(at, &count, sizeof count);
   at += sizeof count;
   for (std::string const& text : strings) {
-    TLength const length = static_cast<TLength>(text.size());
+    auto const length = static_cast<TLength>(text.size());
     std::memcpy(at, &length, sizeof length);
     std::memcpy(at + sizeof length, text.data(), length);
     at += sizeof length + length;

@@ -49,7 +49,7 @@ TInteger ReadInteger(std::string_view digits, TType type, TMofSpan const& span) 
 template <class T>
 TCIMValue IntegerValue(std::string_view text, TType type, TMofSpan const& span) {
   TInteger const integer = ReadInteger(text, type, span);
-  std::uint64_t const greatest = static_cast<std::uint64_t>(std::numeric_limits<T>::max());
+  auto const greatest = static_cast<std::uint64_t>(std::numeric_limits<T>::max());
   std::uint64_t const greatestNegative = std::is_signed_v<T> ? greatest + 1 : 0;  // the greatest magnitude of a negative number
   if (integer.fMagnitude > (integer.fIsNegative ? greatestNegative : greatest)) RefuseRange(span, type);
   return TCIMValue(static_cast<T>(integer.fIsNegative ? 0 - integer.fMagnitude : integer.fMagnitude));

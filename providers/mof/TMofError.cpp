@@ -9,7 +9,7 @@ namespace {
 
 std::string PositionOf(TMofSpan const& span) {
   std::string const& text = span.fFile->fText;
-  std::size_t const offset = static_cast<std::size_t>(span.fText.data() - text.data());
+  auto const offset = static_cast<std::size_t>(span.fText.data() - text.data());
   auto const end = text.begin() + static_cast<std::ptrdiff_t>(offset);
   std::size_t const lineStart = offset == 0 ? 0 : text.rfind('\n', offset - 1) + 1;  // npos + 1 is 0
   return span.fFile->fName + ":" + std::to_string(std::count(text.begin(), end, '\n') + 1) + ":" +

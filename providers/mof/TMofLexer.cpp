@@ -34,7 +34,7 @@ bool IsOfName(char c) { return KindOf(c) == kLetter || KindOf(c) == kDigit; }
 
 TMofToken TMofLexer::Next() {
   SkipBlanksAndComments();
-  if (fNext == fEnd) return {TMofToken::kEnd, std::string_view(fEnd, 0)};
+  if (fNext == fEnd) return Take(TMofToken::kEnd, fEnd);
   switch (KindOf(*fNext)) {
     case kLetter:
       return Take(TMofToken::kName, EndOfName(fNext));

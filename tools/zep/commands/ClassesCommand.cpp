@@ -89,7 +89,7 @@ struct TClasses {
   // Why classes are missing.
   std::vector<std::string> Reasons() const {
     std::vector<std::string> reasons = fFailures;
-    if (IsEmpty()) reasons.push_back("no class was found");
+    if (IsEmpty()) reasons.emplace_back("no class was found");
     return reasons;
   }
 };

@@ -104,7 +104,7 @@ std::string Joined(std::vector<std::string> const& texts, std::string const& sep
 
 std::string SizeText(std::uint64_t bytes) {
   constexpr char const* units[] = {"B", "KiB", "MiB", "GiB", "TiB"};
-  double size = static_cast<double>(bytes);
+  auto size = static_cast<double>(bytes);
   std::size_t unit = 0;
   for (; unit + 1 < std::size(units) && size >= 1023.95; ++unit) size /= 1024;  // 1023.95 and more would be rounded to 1024
   long const tenths = std::lround(size * 10);
