@@ -577,11 +577,14 @@ TEST(ZepRenameTest, WhatTheServerDoesNotRemoveIsNamed) {
     char const* what;
     std::string kind;
     char const* config;
-    char const* before;  // what is there of that name
-    char const* left;    // what is there of another name
+    char const* before;   // what is there of that name
+    char const* left;     // what is there of another name
+    char const* purpose;  // of that
   } const rows[] = {
-      {"its own temporary file", "ftp", "<Limit RNFR RNTO DELE>\nDenyAll\n</Limit>", "", "text"},
-      {"the file that was there", "sftp", "ForceCommand internal-sftp -P remove", "former", "former"},
+      {"its own temporary file", "ftp", "<Limit RNFR RNTO DELE>\nDenyAll\n</Limit>", "", "text",
+       "which the upload needed for a while"},
+      {"the file that was there", "sftp", "ForceCommand internal-sftp -P remove", "former", "former",
+       "the file that was replaced"},
   };
   for (auto const& row : rows) {
     SCOPED_TRACE(row.what);
@@ -598,8 +601,7 @@ TEST(ZepRenameTest, WhatTheServerDoesNotRemoveIsNamed) {
     std::string const left = NamesIn(tree).back();
     EXPECT_EQ(ReadFile(tree + left), row.left);
     std::string const url = row.kind + "://zep@127.0.0.1:" + server.Port() + "/d/" + left;
-    EXPECT_THAT(run.output,
-                HasSubstr("zep: warning: the server did not remove " + url + ", which the upload needed for a while\n"));
+    EXPECT_THAT(run.output, HasSubstr("zep: warning: the server did not remove " + url + ", " + row.purpose + "\n"));
     EXPECT_THAT(run.output, testing::ContainsRegex("\"leftOnServer\": \\[[ \n]*\"" + url + "\""));
   }
 }
@@ -628,6 +630,130 @@ TEST(ZepRenameTest, ADirectoryIsNotReplacedByAFile) {
     EXPECT_EQ(ReadFile(tree.Path("d/uploads/a")), "precious");
     EXPECT_TRUE(fs::is_symlink(tree.Path("d/link")));
   }
+}
+
+// The URL names a directory that the server does not let the user enter or list, or whose check gets no answer.
+class ZepHiddenDirectoryTest : public testing::Test {
+protected:
+  void Start(std::string const& protocol) {
+    std::string const why = WhyNoServer(protocol + ".sh");
+    NEEDS(why.empty(), why);
+    fServer = std::make_unique<TFileServer>(protocol);
+  }
+
+  // A directory with one file; it belongs to that user.
+  void MakeDirectory(std::string const& name, uid_t owner, unsigned mode) const {
+    std::string const path = fServer->Tree().Path(name);
+    fs::create_directories(path);
+    WriteFile(path + "/a", "precious");
+    EXPECT_EQ(::chown(path.c_str(), owner, static_cast<gid_t>(-1)), 0);
+    fs::permissions(path, static_cast<fs::perms>(mode));
+  }
+
+  TProgramRun Send(std::string const& options, std::string const& url) const {
+    WriteFile(fDir.Path("f"), "text");
+    return Zep("send " + options + fDir.Path("f") + " " + url);
+  }
+
+  void ExpectDirectoryAlone(std::string const& parent, std::string const& name) const {
+    EXPECT_EQ(NamesIn(fServer->Tree().Path(parent)), std::vector<std::string>{name});
+    EXPECT_EQ(ReadFile(fServer->Tree().Path(parent + "/" + name + "/a")), "precious");
+  }
+
+  static constexpr uid_t kFtpUser = 65534, kSftpGuest = 2999;
+  TTempDir fDir;
+  std::unique_ptr<TFileServer> fServer;
+};
+
+TEST_F(ZepHiddenDirectoryTest, OverFtpADirectoryThatCannotBeEnteredIsNotReplaced) {
+  ASSERT_NO_FATAL_FAILURE(Start("ftp"));
+  if (IsSkipped()) return;
+  MakeDirectory("uploads", kFtpUser, 0);
+  TProgramRun const run = Send("", fServer->Url("uploads"));
+  EXPECT_EQ(run.exitCode, kNothing);
+  EXPECT_THAT(run.output, EndsWith(": 550; if uploads is a directory, end the URL with \"/\"\n")) << fServer->Log();
+  ExpectDirectoryAlone("", "uploads");
+}
+
+TEST_F(ZepHiddenDirectoryTest, OverSftpADirectoryThatCannotBeListedIsNotReplaced) {
+  ASSERT_NO_FATAL_FAILURE(Start("sftp"));
+  if (IsSkipped()) return;
+  std::string const url = "sftp://" + fServer->Host("guest") + "/incoming/uploads";
+  MakeDirectory("incoming/uploads", kSftpGuest, 0333);
+  TProgramRun run = Send("", url);
+  EXPECT_EQ(run.exitCode, kNothing);
+  EXPECT_THAT(run.output, EndsWith(": uploads is a directory; end the URL with \"/\"\n"));
+  ExpectDirectoryAlone("incoming", "uploads");
+
+  // Its parent cannot be listed either.
+  fs::permissions(fServer->Tree().Path("incoming"), static_cast<fs::perms>(0333));
+  run = Send("", url);
+  EXPECT_EQ(run.exitCode, kNothing);
+  EXPECT_THAT(run.output, EndsWith("; if uploads is a directory, end the URL with \"/\"\n"));
+  ExpectDirectoryAlone("incoming", "uploads");
+}
+
+TEST_F(ZepHiddenDirectoryTest, OverSftpAFileInADirectoryThatCannotBeListedIsReplaced) {
+  ASSERT_NO_FATAL_FAILURE(Start("sftp"));
+  if (IsSkipped()) return;
+  std::string const incoming = fServer->Tree().Path("incoming");
+  WriteFile(incoming + "/f", "old");
+  EXPECT_EQ(::chown((incoming + "/f").c_str(), kSftpGuest, static_cast<gid_t>(-1)), 0);
+  fs::permissions(incoming, static_cast<fs::perms>(0333));
+  TProgramRun const run = Send("", "sftp://" + fServer->Host("guest") + "/incoming/f");
+  EXPECT_EQ(run.exitCode, kComplete) << run.output;
+  EXPECT_EQ(ReadFile(incoming + "/f"), "text");
+  EXPECT_EQ(NamesIn(incoming), std::vector<std::string>{"f"});
+}
+
+TEST_F(ZepHiddenDirectoryTest, ACheckWithoutAnAnswerReplacesNothing) {
+  ASSERT_NO_FATAL_FAILURE(Start("ftp"));
+  if (IsSkipped()) return;
+  MakeDirectory("uploads", kFtpUser, 0755);
+  struct TRow {
+    char const* fOption;
+    int fExitCode;
+    std::string fReason;
+  };
+  TRow const rows[] = {{"--hold", kStalled, ": nothing moved for 2 s\n"}, {"--cut", kNothing, "\n"}};
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.fOption);
+    TServer const relay("relay.py", {"--ftp", row.fOption, "1", "CWD uploads", "0", fServer->Port(), "1000000"});
+    TProgramRun const run = Send("--stall 2 --clean-up 90 ", fServer->UrlAt(relay.Port(), "uploads"));
+    EXPECT_EQ(run.exitCode, row.fExitCode);
+    EXPECT_THAT(run.output, EndsWith(row.fReason));
+    ExpectDirectoryAlone("", "uploads");
+  }
+}
+
+// Such a file may as well be a directory that cannot be entered.
+TEST_F(ZepTransferTest, AFileThatTheServerDoesNotProveToBeOneDoesNotMakeWay) {
+  TFileServer const server("ftp", {{"EXTRA_CONFIG", "<Directory />\nAllowOverwrite off\n</Directory>"}});
+  WriteFile(server.Tree().Path("f"), "old");
+  TServer const relay("relay.py", {"--ftp", "--hide-size", "0", server.Port(), "1000000"});
+  TProgramRun const run = Zep("send " + Local("f", "new") + " " + server.UrlAt(relay.Port(), "f"));
+  EXPECT_EQ(run.exitCode, kNothing);
+  EXPECT_THAT(run.output, EndsWith("; if f is a directory, end the URL with \"/\"\n")) << server.Log();
+  EXPECT_EQ(NamesIn(server.Tree().Path()), std::vector<std::string>{"f"});
+  EXPECT_EQ(ReadFile(server.Tree().Path("f")), "old");
+}
+
+// After the earlier file has lost its name, the relay refuses to give it to any file.
+TEST_F(ZepTransferTest, AnEmptyPlaceIsReported) {
+  TFileServer const server("ftp", {{"EXTRA_CONFIG", "<Directory />\nAllowOverwrite off\n</Directory>"}});
+  std::string const tree = server.Tree().Path();
+  WriteFile(tree + "/f", "old");
+  std::vector<std::string> arguments = {"--ftp", "--refuse", "0", "STOR f\r"};
+  for (char const* const renaming : {"3", "4", "5"})  // of the new file, of the earlier file, and of that once more
+    for (std::string const word : {"--refuse", renaming, "RNFR"}) arguments.push_back(word);
+  for (std::string const& word : {std::string("0"), server.Port(), std::string("1000000")}) arguments.push_back(word);
+  TServer const relay("relay.py", arguments);
+  TProgramRun const run = Zep("send " + Local("f", "new") + " " + server.UrlAt(relay.Port(), "f"));
+  EXPECT_EQ(run.exitCode, kNothing);
+  ASSERT_EQ(NamesIn(tree).size(), 1u) << run.output << server.Log();
+  std::string const former = NamesIn(tree).front(), url = "ftp://zep@127.0.0.1:" + relay.Port() + "/";
+  EXPECT_EQ(ReadFile(tree + "/" + former), "old");
+  EXPECT_THAT(run.output, EndsWith("; no file has the name " + url + "f now: the earlier file is " + url + former + "\n"));
 }
 
 TEST(ZepRenameTest, OverSftpTheModeOfAReplacedFileStays) {

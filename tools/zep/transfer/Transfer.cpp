@@ -11,10 +11,11 @@
 #include "tools/zep/processes/TChildProcess.h"
 #include "tools/zep/processes/WriteWhole.h"
 #include "tools/zep/secrets/Secrets.h"
-#include "tools/zep/transfer/FileTransfer.h"
+#include "tools/zep/transfer/Download.h"
 #include "tools/zep/transfer/PartNote.h"
 #include "tools/zep/transfer/Sha256.h"
 #include "tools/zep/transfer/Unreachable.h"
+#include "tools/zep/transfer/Upload.h"
 
 #include <fcntl.h>
 #include <linux/fs.h>
@@ -191,18 +192,23 @@ std::string JoinedByAnd(std::vector<std::string> const& texts) {
   return joined;
 }
 
-// What is known besides of an upload: why its file could not be read, and what may be left on the server.
+// Adds what is known of an upload besides its outcome: why its file could not be read, and what may be left on the server.
 void ExplainUpload(TTransferred& transferred, TRemote const& place, TUploadNames const& names, TTransferState const& state) {
   TOutcome& outcome = transferred.fOutcome;
+  bool const isComplete = outcome.fExit == kExitComplete;
   if (state.fReadError != 0) outcome = {outcome.fStatus, kExitNoInput, ReasonOf(state.fReadError)};
   std::vector<std::string>& left = transferred.fLeftOnServer;
   if (state.fLeft & kLeftTemporary) left.push_back(ShownUrlOf(Beside(place, names.fTemporary)));
   if (state.fLeft & kLeftAtPlace) left.push_back(ShownUrlOf(place));
-  if (outcome.fExit != kExitComplete && !left.empty())
-    outcome.fReason += "; the server may have a part of it: " + JoinedByAnd(left);
+  if (!isComplete && !left.empty()) outcome.fReason += "; the server may have a part of it: " + JoinedByAnd(left);
   if ((state.fLeft & kLeftFormer) == 0) return;
-  left.push_back(ShownUrlOf(Beside(place, names.fFormer)));
-  if (outcome.fExit != kExitComplete) outcome.fReason += "; the file that was there may now be " + left.back();
+  transferred.fFormerUrl = ShownUrlOf(Beside(place, names.fFormer));
+  left.push_back(transferred.fFormerUrl);
+  bool const isPlaceEmpty = (state.fLeft & kLeftPlaceEmpty) && !(state.fLeft & kLeftAtPlace);
+  if (isComplete) return;
+  if (isPlaceEmpty) outcome.fReason += "; no file has the name " + ShownUrlOf(place) + " now: the earlier file is ";
+  if (!isPlaceEmpty) outcome.fReason += "; the earlier file may now be ";
+  outcome.fReason += transferred.fFormerUrl;
 }
 
 // ---- Fetching ----
@@ -417,7 +423,7 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
       Transfer([&] { return Upload(place, names, file, cleanUpSeconds, *state); }, *state, transferred.fBytes, options);
   EExitStatus const exit = transferred.fOutcome.fExit;
   bool const wasEnded = exit == kExitStalled || exit >= kExitHangUp;
-  if (wasEnded && (state->fLeft & (kLeftTemporary | kLeftAtPlace)))
+  if (wasEnded && (state->fLeft & (kLeftTemporary | kLeftAtPlace | kLeftPlaceEmpty)))
     CleanUp(place, names, CleanUpSecondsAfterEnd(options), *state);
   ExplainNoConnection(transferred.fOutcome, place);
   ExplainUpload(transferred, place, names, *state);
@@ -447,10 +453,12 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
 }
 
 void WarnOfLeft(TTransferred const& transferred) {
-  bool const isComplete = transferred.fOutcome.fExit == kExitComplete;  // else the reason tells
-  if (!isComplete || transferred.fLeftOnServer.empty()) return;
-  std::cerr << "zep: warning: the server did not remove " << JoinedByAnd(transferred.fLeftOnServer)
-            << ", which the upload needed for a while\n";
+  if (transferred.fOutcome.fExit != kExitComplete) return;  // the reason has it
+  for (std::string const& url : transferred.fLeftOnServer) {
+    bool const isFormer = url == transferred.fFormerUrl;
+    std::cerr << "zep: warning: the server did not remove " << url
+              << (isFormer ? ", the file that was replaced\n" : ", which the upload needed for a while\n");
+  }
 }
 
 TJson DocumentOf(TTransferred const& transferred, std::string const& command) {

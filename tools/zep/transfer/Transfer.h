@@ -46,6 +46,7 @@ struct TTransferred {
   std::uint64_t fBytes = 0;
   std::string fSha256;                     // of the local file; when all went well
   std::vector<std::string> fLeftOnServer;  // URLs for people: what an upload may have left there beside the file
+  std::string fFormerUrl;                  // the one of these that is the earlier file; empty when there is none
 };
 
 // Warns on standard error of what an upload that went well left on the server.

@@ -5,7 +5,7 @@
 #include "tests/Support.h"
 #include "tools/zep/processes/Interrupts.h"
 #include "tools/zep/secrets/Secrets.h"
-#include "tools/zep/transfer/FileTransfer.h"
+#include "tools/zep/transfer/TransferState.h"
 
 #include <fcntl.h>
 #include <sys/wait.h>

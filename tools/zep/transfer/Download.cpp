@@ -1,0 +1,141 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/zep/transfer/Download.h"
+
+#include "TZEPFailure.h"
+#include "core/Handles.h"
+#include "tools/zep/processes/WriteWhole.h"
+#include "tools/zep/transfer/PartNote.h"
+#include "tools/zep/transfer/TConnection.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+
+#include <cerrno>
+#include <cstring>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+class TDownload {
+public:
+  TDownload(TRemote const& remote, std::string const& file, bool isThere, std::uint64_t mostBytes, TTransferState& state)
+      : fUrl(UrlOf(remote)), fShownUrl(ShownUrlOf(remote)), fPath(file), fMostBytes(mostBytes), fState(state), fIsThere(isThere) {
+    fConnection.Set(CURLOPT_WRITEFUNCTION, &Write);
+    fConnection.Set(CURLOPT_WRITEDATA, this);
+    fConnection.Set(CURLOPT_FILETIME, 1L);
+    fConnection.Set(CURLOPT_MAXFILESIZE_LARGE, static_cast<curl_off_t>(mostBytes));  // where the server reports the size
+  }
+
+  void Run() {
+    FindStart();
+    CURLcode code = Fetch();
+    if (fStart > 0 && !fFile && IsStartedAnew(code)) {
+      fStart = 0;
+      fIsOther = false;
+      code = Fetch();
+    }
+    bool const isWholeTooLarge = code == CURLE_OK && fMostBytes > 0 && fStart > fMostBytes;
+    if (code == CURLE_FILESIZE_EXCEEDED || isWholeTooLarge) fState.fIsTooLarge = true;
+    if (fState.fIsTooLarge) FailFor(code);
+    if (code == CURLE_OK && !fFile) Open();  // of an empty remote file no byte comes
+    if (code != CURLE_OK || fError != 0) FailFor(code);
+  }
+
+private:
+  // A part is continued when its time is in whole seconds (MarkForResuming) and it has a note.
+  void FindStart() {
+    struct stat status {};
+    bool const isPart = fIsThere && ::lstat(fPath.c_str(), &status) == 0 && S_ISREG(status.st_mode) && status.st_size > 0;
+    if (!isPart || status.st_mtim.tv_nsec != 0) return;
+    fNote = ReadNote(fPath);
+    if (fNote.empty()) return;
+    fStart = static_cast<std::uint64_t>(status.st_size);
+    fTimeOfPart = status.st_mtim.tv_sec;
+  }
+
+  CURLcode Fetch() {
+    fState.fMoved = fStart;
+    fConnection.Set(CURLOPT_RESUME_FROM_LARGE, static_cast<curl_off_t>(fStart));
+    return fConnection.Perform(fUrl);
+  }
+
+  // Whether the part is the beginning of the remote file, which has that size now.
+  bool IsPartOf(std::int64_t remoteSize) const {
+    return fConnection.RemoteTime() == fTimeOfPart && fNote == NoteFor(fShownUrl, remoteSize);
+  }
+
+  // Whether the part must be replaced: it is of another file, or the server cannot start in the middle.
+  bool IsStartedAnew(CURLcode code) {
+    if (code == CURLE_OK) return !IsPartOf(static_cast<std::int64_t>(fStart));  // nothing was missing, if it is the same file
+    return fIsOther || code == CURLE_BAD_DOWNLOAD_RESUME || code == CURLE_FTP_COULDNT_USE_REST || code == CURLE_RANGE_ERROR;
+  }
+
+  // Opens the part when the first bytes have arrived. False, with fError or fIsOther, when nothing may be written.
+  bool Open() {
+    std::int64_t const toCome = fConnection.BytesToCome();
+    std::int64_t const size = toCome < 0 ? -1 : toCome + static_cast<std::int64_t>(fStart);
+    fIsOther = fStart > 0 && !IsPartOf(size);
+    if (fIsOther) return false;
+    int const how = fStart > 0 ? O_APPEND : fIsThere ? O_CREAT | O_TRUNC : O_CREAT | O_EXCL;
+    fFile = TUniqueFd(::open(fPath.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC | how, kModeOfPart));
+    if (!fFile) fError = errno;
+    if (!fFile) return false;
+    ::fchmod(fFile.get(), kModeOfPart);  // of an earlier part; a file system without modes refuses it
+    if (fStart == 0) WriteNote(fPath, NoteFor(fShownUrl, size));
+    fState.fRemoteTime = fConnection.RemoteTime();  // only now is it the time of what the part holds
+    return true;
+  }
+
+  // libcurl's write callback. Another result than the number of bytes ends the transfer.
+  static std::size_t Write(char const* bytes, std::size_t size, std::size_t count, void* context) {
+    TDownload& self = *static_cast<TDownload*>(context);
+    std::size_t const length = size * count;
+    if (!self.fFile && !self.Open()) return length + 1;
+    if (self.fMostBytes > 0 && self.fState.fMoved + length > self.fMostBytes) {
+      self.fState.fIsTooLarge = true;
+      return length + 1;
+    }
+    if (!WriteWhole(self.fFile.get(), {bytes, length})) {
+      self.fError = errno;
+      return length + 1;
+    }
+    self.fState.fMoved += length;
+    return length;
+  }
+
+  [[noreturn]] void FailFor(CURLcode code) {
+    if (fError == EEXIST) throw TZEPException(kZEPStatusAlreadyExists);
+    if (fError != 0) throw TZEPFailure(kZEPStatusFileSystemError, std::strerror(fError));
+    TConnection::FailFor(code, fConnection.ErrorText());
+  }
+
+  TConnection fConnection;
+  std::string const fUrl, fShownUrl;
+  std::string const fPath;
+  std::uint64_t const fMostBytes;
+  TTransferState& fState;
+  TUniqueFd fFile;
+  bool const fIsThere;            // whether a file of that name was there before
+  std::uint64_t fStart = 0;       // what is there of it
+  std::int64_t fTimeOfPart = -1;  // the time of that
+  std::string fNote;              // the note of that
+  bool fIsOther = false;          // the remote file is not the one that it came from
+  int fError = 0;                 // errno of writing
+};
+
+}  // namespace
+
+TZEPStatusCode Download(TRemote const& remote, std::string const& file, bool isThere, std::uint64_t mostBytes,
+                        TTransferState& state) {
+  TDownload(remote, file, isThere, mostBytes, state).Run();
+  return kZEPStatusOK;
+}
+
+void MarkForResuming(std::string const& part, TTransferState const& state) {
+  if (state.fRemoteTime < 0) return;
+  timespec const times[] = {{0, UTIME_OMIT}, {static_cast<time_t>(state.fRemoteTime), 0}};
+  ::utimensat(AT_FDCWD, part.c_str(), times, AT_SYMLINK_NOFOLLOW);
+}
+
+}  // namespace NQRVZEP20::zep
