@@ -20,17 +20,17 @@ std::string const kPassword = "zeppass1";
 
 TKeys Keys() {
   TKeys keys{};
-  keys.size = IPMI_HMAC_SHA1_DIGEST_LENGTH;
-  keys.integrity.fill(1);
-  keys.confidentiality.fill(2);
+  keys.fSize = IPMI_HMAC_SHA1_DIGEST_LENGTH;
+  keys.fIntegrity.fill(1);
+  keys.fConfidentiality.fill(2);
   return keys;
 }
 
 TSession15 Session15(unsigned char authentication) {
   TSession15 session;
-  session.id = kClientsId;
-  session.nextPacket = session.firstReply = 1;
-  session.authentication = authentication;
+  session.fId = kClientsId;
+  session.fNextPacket = session.fFirstReply = 1;
+  session.fAuthentication = authentication;
   return session;
 }
 
@@ -56,8 +56,8 @@ void ReadChanged(IEnvelope& controllers, IEnvelope const& clients, TMessage cons
   EVerdict const verdict = clients.Unpack(packet, reply);
   if (packet == whole) Require(verdict == EVerdict::kAnswer);
   if (verdict != EVerdict::kAnswer || (!isSigned && packet != whole)) return;
-  Require(reply.netFn == answer.netFn && reply.sequence == answer.sequence && reply.command == answer.command);
-  Require(reply.completionCode == answer.data[0] && reply.data == TByteVector(answer.data.begin() + 1, answer.data.end()));
+  Require(reply.fNetFn == answer.fNetFn && reply.fSequence == answer.fSequence && reply.fCommand == answer.fCommand);
+  Require(reply.fCompletionCode == answer.fData[0] && reply.fData == TByteVector(answer.fData.begin() + 1, answer.fData.end()));
 }
 
 }  // namespace

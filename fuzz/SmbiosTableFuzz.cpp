@@ -45,8 +45,8 @@ void ReadIdentity(std::string_view structure) {
   TStructureStrings const strings(structure);
   TMachineIdentity identity;
   ReadProductDescription(strings.NamedAt(5).value_or(""), identity);
-  Require(identity.type.size() == 4);
-  Require(identity.model.size() == 3 || identity.model == "Unknown");
+  Require(identity.fType.size() == 4);
+  Require(identity.fModel.size() == 3 || identity.fModel == "Unknown");
 }
 
 void ReadBiosVersion(std::string_view structure) {

@@ -38,8 +38,8 @@ TIpmiResult SendIpmiCommand(TIpmiCommand const& command, TIpmiResponse& response
   response.fill(0);
   unsigned short length = 0;
   unsigned char completionCode = 0xFF;
-  return Call("SendIpmiCommand", &TIpmiFunctions::fSend, command.command, command.request.data(),
-              static_cast<int>(command.request.size()), response.data(), &length, &completionCode, command.netFn);
+  return Call("SendIpmiCommand", &TIpmiFunctions::fSend, command.fCommand, command.fRequest.data(),
+              static_cast<int>(command.fRequest.size()), response.data(), &length, &completionCode, command.fNetFn);
 }
 
 TIpmiResult CloseIpmiConnection() { return Call("CloseConnection", &TIpmiFunctions::fClose); }

@@ -28,8 +28,8 @@ constexpr char const* kIpmiPort = "623";
 TIpmiResult OpenIpmiConnection(std::string const& host, std::string const& user, std::string const& password);
 
 struct TIpmiCommand {
-  unsigned char netFn, command;
-  std::vector<unsigned char> request;
+  unsigned char fNetFn, fCommand;
+  std::vector<unsigned char> fRequest;
 };
 
 // The response as the library wrote it. Bytes that it did not write are 0; the last byte is always 0.

@@ -42,11 +42,11 @@ std::optional<std::string_view> TStructureStrings::NamedAt(std::size_t offset) c
 void ReadProductDescription(std::string_view description, TMachineIdentity& identity) {
   std::size_t const dash = description.find('-');
   if (dash != description.npos) {
-    identity.name = description.substr(0, dash);
-    AssignWhole(identity.type, description, dash + 2, 4);
-    AssignWhole(identity.model, description, dash + 6, 3);
+    identity.fName = description.substr(0, dash);
+    AssignWhole(identity.fType, description, dash + 2, 4);
+    AssignWhole(identity.fModel, description, dash + 6, 3);
   } else if (description.size() == 7) {
-    identity.type = description.substr(0, 4);
+    identity.fType = description.substr(0, 4);
   }
 }
 
@@ -60,7 +60,7 @@ std::string CleanBiosVersion(std::string version) {
 
 std::optional<std::string> MachineTypeOfBuild(std::string_view buildNumber) {
   for (TMachineTypeRow const& row : kMachineTypeTable)
-    if (buildNumber.find(row.buildPrefix) != buildNumber.npos) return std::string(row.machineType);
+    if (buildNumber.find(row.fBuildPrefix) != buildNumber.npos) return std::string(row.fMachineType);
   return std::nullopt;
 }
 

@@ -10,10 +10,10 @@ namespace NQRVZEP20 {
 
 // The identity of a machine, from SMBIOS type 1. Each field starts as the text for an unreadable value.
 struct TMachineIdentity {
-  std::string type = "0000";
-  std::string name = "Unknown";
-  std::string model = "Unknown";
-  std::string serialNumber = "Unknown";
+  std::string fType = "0000";
+  std::string fName = "Unknown";
+  std::string fModel = "Unknown";
+  std::string fSerialNumber = "Unknown";
 };
 
 // The strings of one SMBIOS structure, given from its first byte to the end of its string set.

@@ -7,8 +7,8 @@ namespace NQRVZEP20 {
 
 // The server families by the prefix of their BIOS builds. The table is searched in this order.
 struct TMachineTypeRow {
-  std::string_view buildPrefix;  // two characters, lower case
-  std::string_view machineType;  // four digits
+  std::string_view fBuildPrefix;  // two characters, lower case
+  std::string_view fMachineType;  // four digits
 };
 
 inline constexpr TMachineTypeRow kMachineTypeTable[] = {

@@ -33,11 +33,11 @@ void LogIdentity(std::string const& productDescription, TMachineIdentity const& 
   LogDebug("GetMachineInfo productDesc");
   LogDebug(productDescription);
   LogDebug("GetMachineInfo machineName");
-  LogDebug(identity.name);
+  LogDebug(identity.fName);
   LogDebug("GetMachineInfo machineType");
-  LogDebug(identity.type);
+  LogDebug(identity.fType);
   LogDebug("GetMachineInfo machineModel");
-  LogDebug(identity.model);
+  LogDebug(identity.fModel);
 }
 
 // The status that is logged when the tables cannot be opened.
@@ -87,8 +87,8 @@ TMachineIdentity IdentityIn(std::string_view systemInformation, EIdentityLog log
   std::string const productDescription(strings.NamedAt(kProductName).value_or(""));
   ReadProductDescription(productDescription, identity);
   if (logged == EIdentityLog::kAll) LogIdentity(productDescription, identity);
-  if (std::optional<std::string_view> const number = strings.NamedAt(kSerialNumber)) identity.serialNumber = *number;
-  LogDebug("Machine type detected: ", identity.type);
+  if (std::optional<std::string_view> const number = strings.NamedAt(kSerialNumber)) identity.fSerialNumber = *number;
+  LogDebug("Machine type detected: ", identity.fType);
   return identity;
 }
 
@@ -106,7 +106,7 @@ TMachineIdentity ReadMachineIdentity(EIdentityLog logged) {
 
 // The messages of a reader of the BIOS version.
 struct TBiosVersionMessages {
-  std::string_view unableToOpen, retrieving, readFailed, noMoreItems;
+  std::string_view fUnableToOpen, fRetrieving, fReadFailed, fNoMoreItems;
 };
 
 constexpr TBiosVersionMessages kGetBiosIDMessages = {
@@ -144,19 +144,19 @@ public:
   std::optional<std::string> Read() {
     int const openStatus = fTables ? OpenStatusOf(*fTables) : static_cast<int>(kZEPStatusOutOfMemory);
     if (openStatus != kZEPStatusOK) {
-      LogDebug(fMessages.unableToOpen, openStatus);
+      LogDebug(fMessages.fUnableToOpen, openStatus);
       return std::nullopt;
     }
 
-    LogDebug(fMessages.retrieving);
+    LogDebug(fMessages.fRetrieving);
     int length = 0;
     int const status = fTables->GetFirst(kBiosInformation, fBuffer.get(), kBufferSize, length);
     if (status == kZEPStatusFail) {
-      LogDebug(fMessages.readFailed);
+      LogDebug(fMessages.fReadFailed);
       return std::string();
     }
     if (status == kZEPStatusNoMoreItems) {
-      LogDebug(fMessages.noMoreItems);
+      LogDebug(fMessages.fNoMoreItems);
       return std::nullopt;
     }
     return BiosVersionIn(fBuffer.get());
@@ -181,10 +181,10 @@ std::string LowerCase(std::string text) {
 std::string TOSSpecific::GetMachineInfo(std::string key) {
   LogDebug("getMachineInfo() entered.");
   TMachineIdentity const identity = ReadMachineIdentity(EIdentityLog::kAll);
-  if (key == "type") return identity.type;
-  if (key == "name") return identity.name;
-  if (key == "model") return identity.model;
-  if (key == "SN") return identity.serialNumber;
+  if (key == "type") return identity.fType;
+  if (key == "name") return identity.fName;
+  if (key == "model") return identity.fModel;
+  if (key == "SN") return identity.fSerialNumber;
   return "error param of GetMachineInfo";
 }
 
@@ -199,7 +199,7 @@ std::string TOSSpecific::GetOperatingSystemName() { return GetMachineName(); }
 
 std::string TOSSpecific::GetMachineType() {
   LogDebug("getMachineType() entered.");
-  return ReadMachineIdentity(EIdentityLog::kTypeOnly).type;
+  return ReadMachineIdentity(EIdentityLog::kTypeOnly).fType;
 }
 
 std::string TOSSpecific::GetMachineTypeFromID() {

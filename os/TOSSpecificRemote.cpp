@@ -35,13 +35,13 @@ std::string CharactersOf(TIpmiResponse const& response, std::size_t place, std::
 }
 
 struct TAccess {
-  std::string const &host, &user, &password;
+  std::string const &fHost, &fUser, &fPassword;
 };
 
 // Reads the FRU data of a controller from `offset` on, and returns the field that `fieldOf` finds in the response.
 template <class TField>
 std::string ReadRemote(std::string_view operation, TAccess const& access, unsigned offset, TField fieldOf) {
-  if (!OpenIpmiConnection(access.host, access.user, access.password)) return "";
+  if (!OpenIpmiConnection(access.fHost, access.fUser, access.fPassword)) return "";
   std::optional<TIpmiResponse> const response = ReadFruData(offset);
   if (!response) return "N/A";
   LogDebug("SendIpmiCommand successfully. \nrspBuffer for ", operation, ":");

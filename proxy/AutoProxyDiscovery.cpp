@@ -98,7 +98,7 @@ void EndProcess(std::string const& number) {
 // ---- Interfaces ----
 
 struct TInterface {
-  std::string name, address, hardwareAddress;
+  std::string fName, fAddress, fHardwareAddress;
 };
 
 // The names of the interfaces, each once; the system lists an interface once for each of its addresses.
@@ -147,7 +147,7 @@ std::string HardwareAddressIn(ifreq const& answer) {
 
 // Reads the addresses of an interface, which may be down. Logs the reason and returns false when something cannot be read.
 bool ReadInterface(int query, std::string const& name, TInterface& interface) {
-  interface.name = name;
+  interface.fName = name;
   ifreq answer;
   if (!AskSystem(query, SIOCGIFFLAGS, name, answer)) return false;
   if ((answer.ifr_flags & IFF_PROMISC) != 0) LogDebug("the interface is PROMISC!");
@@ -157,9 +157,9 @@ bool ReadInterface(int query, std::string const& name, TInterface& interface) {
     LogDebug("the interface status is DOWN!");
 
   if (!AskSystem(query, SIOCGIFADDR, name, answer)) return false;
-  interface.address = AddressIn(answer);
+  interface.fAddress = AddressIn(answer);
   if (!AskSystem(query, SIOCGIFHWADDR, name, answer)) return false;
-  interface.hardwareAddress = HardwareAddressIn(answer);
+  interface.fHardwareAddress = HardwareAddressIn(answer);
   return true;
 }
 
@@ -194,9 +194,9 @@ std::string SendAndReceive(int sender, int receiver, unsigned char const* messag
 std::string Ask(TInterface interface) {
   TUniqueFd const sender(AutoProxyDiscovery::open_send_socket());
   if (!sender) return "";
-  TUniqueFd const receiver(AutoProxyDiscovery::open_recv_socket(interface.name.data()));
+  TUniqueFd const receiver(AutoProxyDiscovery::open_recv_socket(interface.fName.data()));
   if (!receiver) return "";
-  TMessage const message(AutoProxyDiscovery::make_message(interface.address, interface.hardwareAddress));
+  TMessage const message(AutoProxyDiscovery::make_message(interface.fAddress, interface.fHardwareAddress));
   return message ? SendAndReceive(sender.get(), receiver.get(), message.get()) : "";
 }
 
@@ -219,8 +219,8 @@ std::string AskForEachInterface(TInterface& interface) {
 }
 
 std::string AskWithIPV6Address(TInterface interface) {
-  interface.address = ShownIPV6Address();
-  if (interface.address.empty()) return "";
+  interface.fAddress = ShownIPV6Address();
+  if (interface.fAddress.empty()) return "";
   std::string const url = Ask(interface);
   if (!url.empty()) LogDebug("Get  DHCP wpadurl via IPV6 is =", url);
   return url;

@@ -14,8 +14,8 @@ struct TFailure {
     kOutOfStep,          // the controller and this side disagree on the current step of the opening
   };
 
-  int status;
-  ECause cause = kFinal;
+  int fStatus;
+  ECause fCause = kFinal;
 };
 
 }  // namespace ipmi

@@ -34,7 +34,7 @@ int OpenConnection(int mode, char const* host, char const* port, char const* use
   return kIpmiClientOk;
 } catch (ipmi::TFailure const& failure) {
   Session().reset();
-  return failure.status;
+  return failure.fStatus;
 } catch (std::bad_alloc const&) {
   Session().reset();
   return kIpmiClientOutOfMemory;
@@ -48,12 +48,12 @@ int SendIpmiCommand(unsigned char command, unsigned char const* request, int req
   if (!Session()) return kIpmiClientNoSession;
 
   ipmi::TReply const reply = Session()->Send(netFn, command, ipmi::TByteVector(request, request + requestLength));
-  *completionCode = reply.completionCode;
-  *responseLength = static_cast<unsigned short>(reply.data.size());
-  std::copy(reply.data.begin(), reply.data.end(), response);
-  return reply.completionCode == 0 ? kIpmiClientOk : kIpmiClientCompletionCode;
+  *completionCode = reply.fCompletionCode;
+  *responseLength = static_cast<unsigned short>(reply.fData.size());
+  std::copy(reply.fData.begin(), reply.fData.end(), response);
+  return reply.fCompletionCode == 0 ? kIpmiClientOk : kIpmiClientCompletionCode;
 } catch (ipmi::TFailure const& failure) {
-  return failure.status;
+  return failure.fStatus;
 } catch (std::bad_alloc const&) {
   return kIpmiClientOutOfMemory;
 }

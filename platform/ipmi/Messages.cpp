@@ -46,30 +46,30 @@ TFields RmcpHeader() {
 }
 
 TFields MessageHeader(TMessage const& message) {
-  if (!IPMI_NET_FN_VALID(message.netFn)) throw TFailure{kIpmiClientBadArgument};
+  if (!IPMI_NET_FN_VALID(message.fNetFn)) throw TFailure{kIpmiClientBadArgument};
   TFields header(tmpl_lan_msg_hdr_rq);
-  Checked(::fill_lan_msg_hdr(IPMI_SLAVE_ADDRESS_BMC, message.netFn, IPMI_BMC_IPMB_LUN_BMC, message.sequence, header.Object()));
+  Checked(::fill_lan_msg_hdr(IPMI_SLAVE_ADDRESS_BMC, message.fNetFn, IPMI_BMC_IPMB_LUN_BMC, message.fSequence, header.Object()));
   return header;
 }
 
-TFields MessageBody(TMessage const& message) { return TFields(kMessageForm, Joined({message.command}, message.data)); }
+TFields MessageBody(TMessage const& message) { return TFields(kMessageForm, Joined({message.fCommand}, message.fData)); }
 
 // The parts of the controller's packet that form a message.
 struct TMessageParts {
-  TFields header{tmpl_lan_msg_hdr_rs}, body{kMessageForm}, trailer{tmpl_lan_msg_trlr};
+  TFields fHeader{tmpl_lan_msg_hdr_rs}, fBody{kMessageForm}, fTrailer{tmpl_lan_msg_trlr};
 
   // False when it is not a controller's packet, or was damaged in transit.
   bool ReadReply(TReply& reply) const {
     constexpr std::size_t kBeforeData = 2;  // the command and the completion code
-    TByteVector const bytes = body.Bytes();
-    if (bytes.size() < kBeforeData || ::ipmi_lan_check_checksum(header.Object(), body.Object(), trailer.Object()) != 1)
+    TByteVector const bytes = fBody.Bytes();
+    if (bytes.size() < kBeforeData || ::ipmi_lan_check_checksum(fHeader.Object(), fBody.Object(), fTrailer.Object()) != 1)
       return false;
-    reply.netFn = static_cast<unsigned char>(header.Get("net_fn"));
-    reply.sequence = static_cast<unsigned char>(header.Get("rq_seq"));
-    reply.command = bytes[0];
-    reply.completionCode = bytes[1];
-    reply.data.assign(bytes.begin() + kBeforeData, bytes.end());
-    return reply.netFn % 2 == 1;  // that of a request is even
+    reply.fNetFn = static_cast<unsigned char>(fHeader.Get("net_fn"));
+    reply.fSequence = static_cast<unsigned char>(fHeader.Get("rq_seq"));
+    reply.fCommand = bytes[0];
+    reply.fCompletionCode = bytes[1];
+    reply.fData.assign(bytes.begin() + kBeforeData, bytes.end());
+    return reply.fNetFn % 2 == 1;  // that of a request is even
   }
 };
 
@@ -89,11 +89,11 @@ TMessage MessageOf(unsigned char netFn, unsigned char sequence, TFields const& r
 }
 
 TFields FieldsOf(fiid_field_t* form, TReply const& reply) {
-  return TFields(form, Joined({reply.command, reply.completionCode}, reply.data));
+  return TFields(form, Joined({reply.fCommand, reply.fCompletionCode}, reply.fData));
 }
 
 bool IsAnswerTo(TMessage const& message, TReply const& reply) {
-  return reply.netFn == (message.netFn | 1) && reply.sequence == message.sequence && reply.command == message.command;
+  return reply.fNetFn == (message.fNetFn | 1) && reply.fSequence == message.fSequence && reply.fCommand == message.fCommand;
 }
 
 TReply Ask(TLink& link, IEnvelope& envelope, TMessage const& message, TWaits const& waits, TClock::time_point deadline) {
@@ -110,15 +110,15 @@ TReply Ask(TLink& link, IEnvelope& envelope, TMessage const& message, TWaits con
 // ---- Version 1.5 ----
 
 TEnvelope15::TEnvelope15(TSession15 const& session, std::string const* password) : fSession(session), fPassword(password) {
-  fNewest = session.firstReply - 1;
+  fNewest = session.fFirstReply - 1;
 }
 
 TPacket TEnvelope15::Pack(TMessage const& message) {
-  if (message.data.size() > kMaxRequestLength15) throw TFailure{kIpmiClientBadArgument};
+  if (message.fData.size() > kMaxRequestLength15) throw TFailure{kIpmiClientBadArgument};
   TFields const rmcp = RmcpHeader(), messageHeader = MessageHeader(message), body = MessageBody(message);
   TFields header(tmpl_lan_session_hdr);
-  Checked(::fill_lan_session_hdr(fSession.authentication, fSession.nextPacket, fSession.id, header.Object()));
-  if (fSession.nextPacket != 0 && ++fSession.nextPacket == 0) ++fSession.nextPacket;  // 0 is for packets outside of a session
+  Checked(::fill_lan_session_hdr(fSession.fAuthentication, fSession.fNextPacket, fSession.fId, header.Object()));
+  if (fSession.fNextPacket != 0 && ++fSession.fNextPacket == 0) ++fSession.fNextPacket;  // 0 is for packets outside of a session
   TPacket packet(kLongestPacket);
   packet.resize(static_cast<std::size_t>(Checked(
       ::assemble_ipmi_lan_pkt(rmcp.Object(), header.Object(), messageHeader.Object(), body.Object(),
@@ -133,29 +133,29 @@ EVerdict TEnvelope15::Unpack(TPacket const& packet, TReply& reply) const {
     TFields const rmcp(tmpl_rmcp_hdr), header(tmpl_lan_session_hdr);
     TMessageParts const parts;
     bool const isWhole = Checked(::unassemble_ipmi_lan_pkt(packet.data(), static_cast<unsigned>(packet.size()), rmcp.Object(),
-                                                           header.Object(), parts.header.Object(), parts.body.Object(),
-                                                           parts.trailer.Object(), IPMI_INTERFACE_FLAGS_DEFAULT)) == 1;
+                                                           header.Object(), parts.fHeader.Object(), parts.fBody.Object(),
+                                                           parts.fTrailer.Object(), IPMI_INTERFACE_FLAGS_DEFAULT)) == 1;
     if (!isWhole || !parts.ReadReply(reply)) return EVerdict::kNonsense;
-    reply.packet = static_cast<std::uint32_t>(header.Get("session_sequence_number"));
+    reply.fPacket = static_cast<std::uint32_t>(header.Get("session_sequence_number"));
     return IsOfSession(packet, header) ? EVerdict::kAnswer : EVerdict::kOther;
   });
 }
 
 bool TEnvelope15::IsOfSession(TPacket const& packet, TFields const& header) const {
-  if (header.Get("session_id") != fSession.id || header.Get("authentication_type") != fSession.authentication) return false;
-  if (fSession.nextPacket != 0 && !IsNew(static_cast<std::uint32_t>(header.Get("session_sequence_number")))) return false;
-  if (fSession.authentication == IPMI_AUTHENTICATION_TYPE_NONE) return true;
+  if (header.Get("session_id") != fSession.fId || header.Get("authentication_type") != fSession.fAuthentication) return false;
+  if (fSession.fNextPacket != 0 && !IsNew(static_cast<std::uint32_t>(header.Get("session_sequence_number")))) return false;
+  if (fSession.fAuthentication == IPMI_AUTHENTICATION_TYPE_NONE) return true;
   return ::ipmi_lan_check_packet_session_authentication_code(packet.data(), static_cast<unsigned>(packet.size()),
-                                                             fSession.authentication, fPassword->data(),
+                                                             fSession.fAuthentication, fPassword->data(),
                                                              static_cast<unsigned>(fPassword->size())) == 1;
 }
 
 // ---- Version 2.0 ----
 
 TKeys::~TKeys() {
-  ::explicit_bzero(session.data(), session.size());
-  ::explicit_bzero(integrity.data(), integrity.size());
-  ::explicit_bzero(confidentiality.data(), confidentiality.size());
+  ::explicit_bzero(fSession.data(), fSession.size());
+  ::explicit_bzero(fIntegrity.data(), fIntegrity.size());
+  ::explicit_bzero(fConfidentiality.data(), fConfidentiality.size());
 }
 
 TEnvelope2::TEnvelope2(TCipherSuite const& suite, TKeys const& keys, std::uint32_t ownId, std::uint32_t controllersId)
@@ -170,8 +170,8 @@ TPacket TEnvelope2::Pack(TMessage const& message) {
   if (++fNextPacket == 0) ++fNextPacket;  // 0 is for packets outside of a session
   TPacket packet(kLongestPacket);
   packet.resize(static_cast<std::size_t>(Checked(::assemble_ipmi_rmcpplus_pkt(
-      fSuite.authentication, fSuite.integrity, fSuite.confidentiality, fKeys.integrity.data(), fKeys.size,
-      fKeys.confidentiality.data(), kConfidentialityKeySize, nullptr, 0, rmcp.Object(), header.Object(), messageHeader.Object(),
+      fSuite.fAuthentication, fSuite.fIntegrity, fSuite.fConfidentiality, fKeys.fIntegrity.data(), fKeys.fSize,
+      fKeys.fConfidentiality.data(), kConfidentialityKeySize, nullptr, 0, rmcp.Object(), header.Object(), messageHeader.Object(),
       body.Object(), trailer.Object(), packet.data(), static_cast<unsigned>(packet.size()), IPMI_INTERFACE_FLAGS_DEFAULT))));
   return packet;
 }
@@ -186,17 +186,17 @@ EVerdict TEnvelope2::Unpack(TPacket const& packet, TReply& reply) const {
     TMessageParts const parts;
     auto const size = static_cast<unsigned>(packet.size());
     bool const isWhole = Checked(::unassemble_ipmi_rmcpplus_pkt(
-                             fSuite.authentication, fSuite.integrity, fSuite.confidentiality, fKeys.integrity.data(), fKeys.size,
-                             fKeys.confidentiality.data(), kConfidentialityKeySize, packet.data(), size, rmcp.Object(),
-                             header.Object(), payload.Object(), parts.header.Object(), parts.body.Object(),
-                             parts.trailer.Object(), trailer.Object(), IPMI_INTERFACE_FLAGS_DEFAULT)) == 1;
+                             fSuite.fAuthentication, fSuite.fIntegrity, fSuite.fConfidentiality, fKeys.fIntegrity.data(),
+                             fKeys.fSize, fKeys.fConfidentiality.data(), kConfidentialityKeySize, packet.data(), size,
+                             rmcp.Object(), header.Object(), payload.Object(), parts.fHeader.Object(), parts.fBody.Object(),
+                             parts.fTrailer.Object(), trailer.Object(), IPMI_INTERFACE_FLAGS_DEFAULT)) == 1;
     bool const isGenuine =
         isWhole && header.Get("session_id") == fOwnId &&
-        ::ipmi_rmcpplus_check_packet_session_authentication_code(fSuite.integrity, packet.data(), size, fKeys.integrity.data(),
-                                                                 fKeys.size, nullptr, 0, trailer.Object()) == 1;
+        ::ipmi_rmcpplus_check_packet_session_authentication_code(fSuite.fIntegrity, packet.data(), size, fKeys.fIntegrity.data(),
+                                                                 fKeys.fSize, nullptr, 0, trailer.Object()) == 1;
     if (!isGenuine || !parts.ReadReply(reply)) return EVerdict::kNonsense;
-    reply.packet = static_cast<std::uint32_t>(header.Get("session_sequence_number"));
-    return IsNew(reply.packet) ? EVerdict::kAnswer : EVerdict::kOther;
+    reply.fPacket = static_cast<std::uint32_t>(header.Get("session_sequence_number"));
+    return IsNew(reply.fPacket) ? EVerdict::kAnswer : EVerdict::kOther;
   });
 }
 
@@ -223,11 +223,11 @@ EVerdict UnpackPayload(TPacket const& packet, unsigned char type, TFields& paylo
     TFields const trailer(tmpl_rmcpplus_session_trlr);
     TMessageParts const unused;
     bool const isWhole =
-        Checked(::unassemble_ipmi_rmcpplus_pkt(
-            IPMI_AUTHENTICATION_ALGORITHM_RAKP_NONE, IPMI_INTEGRITY_ALGORITHM_NONE, IPMI_CONFIDENTIALITY_ALGORITHM_NONE, nullptr,
-            0, nullptr, 0, packet.data(), static_cast<unsigned>(packet.size()), rmcp.Object(), header.Object(), bytes.Object(),
-            unused.header.Object(), payload.Object(), unused.trailer.Object(), trailer.Object(), IPMI_INTERFACE_FLAGS_DEFAULT)) ==
-        1;
+        Checked(::unassemble_ipmi_rmcpplus_pkt(IPMI_AUTHENTICATION_ALGORITHM_RAKP_NONE, IPMI_INTEGRITY_ALGORITHM_NONE,
+                                               IPMI_CONFIDENTIALITY_ALGORITHM_NONE, nullptr, 0, nullptr, 0, packet.data(),
+                                               static_cast<unsigned>(packet.size()), rmcp.Object(), header.Object(),
+                                               bytes.Object(), unused.fHeader.Object(), payload.Object(),
+                                               unused.fTrailer.Object(), trailer.Object(), IPMI_INTERFACE_FLAGS_DEFAULT)) == 1;
     return isWhole ? EVerdict::kAnswer : EVerdict::kNonsense;
   });
 }

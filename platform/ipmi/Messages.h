@@ -12,16 +12,16 @@ namespace ipmi {
 constexpr int kMaxRequestLength = 255;
 
 struct TMessage {
-  unsigned char netFn;
-  unsigned char sequence;  // 0 to 63; the answer has the same
-  unsigned char command;
-  TByteVector data;
+  unsigned char fNetFn;
+  unsigned char fSequence;  // 0 to 63; the answer has the same
+  unsigned char fCommand;
+  TByteVector fData;
 };
 
 struct TReply {
-  std::uint32_t packet;  // its number within the session
-  unsigned char netFn, sequence, command, completionCode;
-  TByteVector data;
+  std::uint32_t fPacket;  // its number within the session
+  unsigned char fNetFn, fSequence, fCommand, fCompletionCode;
+  TByteVector fData;
 };
 
 // The request whose command and data are in the fields, and the data of an answer in fields of that form.
@@ -48,7 +48,7 @@ public:
 
   // Stores the reply's packet number. Packets of the session up to this number are no longer accepted as answers: they may be
   // copies.
-  void Accept(TReply const& reply) { fNewest = reply.packet; }
+  void Accept(TReply const& reply) { fNewest = reply.fPacket; }
 
 protected:
   bool IsNew(std::uint32_t packet) const { return static_cast<std::int32_t>(packet - fNewest) > 0; }
@@ -62,10 +62,10 @@ TReply Ask(TLink& link, IEnvelope& envelope, TMessage const& message, TWaits con
 // ---- Version 1.5 ----
 
 struct TSession15 {
-  std::uint32_t id = 0;          // 0: outside of a session
-  std::uint32_t nextPacket = 0;  // of this side. Stays 0 until the session is open
-  std::uint32_t firstReply = 0;  // the number of the controller's first packet
-  unsigned char authentication = IPMI_AUTHENTICATION_TYPE_NONE;
+  std::uint32_t fId = 0;          // 0: outside of a session
+  std::uint32_t fNextPacket = 0;  // of this side. Stays 0 until the session is open
+  std::uint32_t fFirstReply = 0;  // the number of the controller's first packet
+  unsigned char fAuthentication = IPMI_AUTHENTICATION_TYPE_NONE;
 };
 
 class TEnvelope15 : public IEnvelope {
@@ -75,7 +75,7 @@ public:
 
   TPacket Pack(TMessage const& message) override;
   EVerdict Unpack(TPacket const& packet, TReply& reply) const override;
-  std::uint32_t SessionId() const override { return fSession.id; }
+  std::uint32_t SessionId() const override { return fSession.fId; }
 
 private:
   bool IsOfSession(TPacket const& packet, TFields const& header) const;
@@ -87,13 +87,13 @@ private:
 // ---- Version 2.0 ----
 
 struct TCipherSuite {
-  unsigned char authentication, integrity, confidentiality;
+  unsigned char fAuthentication, fIntegrity, fConfidentiality;
 };
 
 // The secrets of a session; wiped at the end.
 struct TKeys {
-  std::array<unsigned char, IPMI_HMAC_SHA256_DIGEST_LENGTH> session, integrity, confidentiality;
-  unsigned size;  // of each
+  std::array<unsigned char, IPMI_HMAC_SHA256_DIGEST_LENGTH> fSession, fIntegrity, fConfidentiality;
+  unsigned fSize;  // of each
 
   ~TKeys();
 };

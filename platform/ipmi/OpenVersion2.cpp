@@ -20,7 +20,7 @@ constexpr TCipherSuite kSuite17 = {IPMI_AUTHENTICATION_ALGORITHM_RAKP_HMAC_SHA25
 
 // The size of the result of the suite's authentication algorithm.
 unsigned DigestSize(TCipherSuite const& suite) {
-  bool const isSha256 = suite.authentication == IPMI_AUTHENTICATION_ALGORITHM_RAKP_HMAC_SHA256;
+  bool const isSha256 = suite.fAuthentication == IPMI_AUTHENTICATION_ALGORITHM_RAKP_HMAC_SHA256;
   return isSha256 ? IPMI_HMAC_SHA256_DIGEST_LENGTH : IPMI_HMAC_SHA1_DIGEST_LENGTH;
 }
 
@@ -58,7 +58,7 @@ public:
   TOpening2(TOpening const& opening, TWay const& way)
       : fOpening(opening),
         fWay(way),
-        fSuite(way.cipherSuite == 17 ? kSuite17 : kSuite3),
+        fSuite(way.fCipherSuite == 17 ? kSuite17 : kSuite3),
         fOwnId(RandomNumber()),
         fTag(static_cast<unsigned char>(RandomNumber())) {
     for (unsigned char& byte : fOwnNumber) byte = static_cast<unsigned char>(RandomNumber());
@@ -79,10 +79,10 @@ private:
   void CheckProof(TFields const& answer) const;
 
   // libfreeipmi requires a null pointer instead of an empty text.
-  char const* Password() const { return PasswordSize() != 0 ? fOpening.target.password.data() : nullptr; }
-  unsigned PasswordSize() const { return static_cast<unsigned>(fOpening.target.password.size()); }
-  char const* User() const { return UserSize() != 0 ? fOpening.target.user.data() : nullptr; }
-  unsigned UserSize() const { return static_cast<unsigned>(fOpening.target.user.size()); }
+  char const* Password() const { return PasswordSize() != 0 ? fOpening.fTarget.fPassword.data() : nullptr; }
+  unsigned PasswordSize() const { return static_cast<unsigned>(fOpening.fTarget.fPassword.size()); }
+  char const* User() const { return UserSize() != 0 ? fOpening.fTarget.fUser.data() : nullptr; }
+  unsigned UserSize() const { return static_cast<unsigned>(fOpening.fTarget.fUser.size()); }
 
   TOpening const& fOpening;
   TWay const fWay;
@@ -99,7 +99,7 @@ private:
 TFields TOpening2::Step(unsigned char type, TFields const& request, unsigned char answerType, fiid_field_t* answerForm) {
   TFields answer(answerForm);
   auto const judge = [&](TPacket const& packet) { return VerdictOn(packet, answerType, answer); };
-  Exchange(fOpening.link, {[&] { return PackPayload(type, request); }, judge}, fOpening.waits, fOpening.deadline);
+  Exchange(fOpening.fLink, {[&] { return PackPayload(type, request); }, judge}, fOpening.fWaits, fOpening.fDeadline);
   return answer;
 }
 
@@ -114,10 +114,10 @@ EVerdict TOpening2::VerdictOn(TPacket const& packet, unsigned char type, TFields
 void TOpening2::AskForSession() {
   // Some controllers refuse a session when the request names a privilege. Without it, a missing privilege of the account is
   // detected in a later step.
-  unsigned char const privilege = fWay.namesPrivilege ? kPrivilege : IPMI_PRIVILEGE_LEVEL_HIGHEST_LEVEL;
+  unsigned char const privilege = fWay.fNamesPrivilege ? kPrivilege : IPMI_PRIVILEGE_LEVEL_HIGHEST_LEVEL;
   TFields request(tmpl_rmcpplus_open_session_request);
-  Checked(::fill_rmcpplus_open_session(++fTag, privilege, fOwnId, fSuite.authentication, fSuite.integrity, fSuite.confidentiality,
-                                       request.Object()));
+  Checked(::fill_rmcpplus_open_session(++fTag, privilege, fOwnId, fSuite.fAuthentication, fSuite.fIntegrity,
+                                       fSuite.fConfidentiality, request.Object()));
   TFields const answer = Step(IPMI_PAYLOAD_TYPE_RMCPPLUS_OPEN_SESSION_REQUEST, request,
                               IPMI_PAYLOAD_TYPE_RMCPPLUS_OPEN_SESSION_RESPONSE, tmpl_rmcpplus_open_session_response);
   CheckStatus(StatusIn(answer), TFailure::kNoSuchCipherSuite);
@@ -138,7 +138,7 @@ void TOpening2::ExchangeNumbers() {
   fControllersGuid = answer.Data("managed_system_guid");
   bool const knowsPassword =
       Checked(::ipmi_rmcpplus_check_rakp_2_key_exchange_authentication_code(
-          fSuite.authentication, Password(), PasswordSize(), fOwnId, fControllersId, fOwnNumber.data(),
+          fSuite.fAuthentication, Password(), PasswordSize(), fOwnId, fControllersId, fOwnNumber.data(),
           static_cast<unsigned>(fOwnNumber.size()), fControllersNumber.data(), static_cast<unsigned>(fControllersNumber.size()),
           fControllersGuid.data(), static_cast<unsigned>(fControllersGuid.size()), kLookup, kPrivilege, User(), UserSize(),
           answer.Object())) == 1;
@@ -146,19 +146,20 @@ void TOpening2::ExchangeNumbers() {
 }
 
 void TOpening2::CalculateKeys() {
-  fKeys.size = DigestSize(fSuite);
-  Checked(::ipmi_calculate_sik(fSuite.authentication, Password(), PasswordSize(), fOwnNumber.data(),
+  fKeys.fSize = DigestSize(fSuite);
+  Checked(::ipmi_calculate_sik(fSuite.fAuthentication, Password(), PasswordSize(), fOwnNumber.data(),
                                static_cast<unsigned>(fOwnNumber.size()), fControllersNumber.data(),
                                static_cast<unsigned>(fControllersNumber.size()), kLookup, kPrivilege, User(), UserSize(),
-                               fKeys.session.data(), fKeys.size));
-  Checked(::ipmi_calculate_k1(fSuite.authentication, fKeys.session.data(), fKeys.size, fKeys.integrity.data(), fKeys.size));
-  Checked(::ipmi_calculate_k2(fSuite.authentication, fKeys.session.data(), fKeys.size, fKeys.confidentiality.data(), fKeys.size));
+                               fKeys.fSession.data(), fKeys.fSize));
+  Checked(::ipmi_calculate_k1(fSuite.fAuthentication, fKeys.fSession.data(), fKeys.fSize, fKeys.fIntegrity.data(), fKeys.fSize));
+  Checked(::ipmi_calculate_k2(fSuite.fAuthentication, fKeys.fSession.data(), fKeys.fSize, fKeys.fConfidentiality.data(),
+                              fKeys.fSize));
 }
 
 TByteVector TOpening2::OwnProof() const {
   TByteVector proof(DigestSize(fSuite));
   int const size = Checked(::ipmi_calculate_rakp_3_key_exchange_authentication_code(
-      fSuite.authentication, Password(), PasswordSize(), fControllersNumber.data(),
+      fSuite.fAuthentication, Password(), PasswordSize(), fControllersNumber.data(),
       static_cast<unsigned>(fControllersNumber.size()), fOwnId, kLookup, kPrivilege, User(), UserSize(), proof.data(),
       static_cast<unsigned>(proof.size())));
   proof.resize(static_cast<std::size_t>(size));
@@ -177,11 +178,11 @@ void TOpening2::ProveToKnowThem() try {
     isOpenAlready = IsEncryptedPayload(packet, IPMI_PAYLOAD_TYPE_RAKP_MESSAGE_4);
     return isOpenAlready ? EVerdict::kAnswer : VerdictOn(packet, IPMI_PAYLOAD_TYPE_RAKP_MESSAGE_4, answer);
   };
-  Exchange(fOpening.link, {[&] { return PackPayload(IPMI_PAYLOAD_TYPE_RAKP_MESSAGE_3, request); }, judge}, fOpening.waits,
-           fOpening.deadline);
+  Exchange(fOpening.fLink, {[&] { return PackPayload(IPMI_PAYLOAD_TYPE_RAKP_MESSAGE_3, request); }, judge}, fOpening.fWaits,
+           fOpening.fDeadline);
   if (!isOpenAlready) CheckProof(answer);  // otherwise its next answer, signed with the session's key, proves the same
 } catch (TFailure const& failure) {
-  if (failure.status != kIpmiClientNoAnswer) throw;
+  if (failure.fStatus != kIpmiClientNoAnswer) throw;
   throw TFailure{kIpmiClientNoAnswer, TFailure::kOutOfStep};
 }
 
@@ -189,7 +190,7 @@ void TOpening2::CheckProof(TFields const& answer) const {
   CheckStatus(StatusIn(answer), TFailure::kOutOfStep);
   bool const isProof =
       Checked(::ipmi_rmcpplus_check_rakp_4_integrity_check_value(
-          fSuite.authentication, fKeys.session.data(), fKeys.size, fOwnNumber.data(), static_cast<unsigned>(fOwnNumber.size()),
+          fSuite.fAuthentication, fKeys.fSession.data(), fKeys.fSize, fOwnNumber.data(), static_cast<unsigned>(fOwnNumber.size()),
           fControllersId, fControllersGuid.data(), static_cast<unsigned>(fControllersGuid.size()), answer.Object())) == 1;
   if (!isProof) throw TFailure{kIpmiClientFail};
 }
@@ -197,7 +198,7 @@ void TOpening2::CheckProof(TFields const& answer) const {
 }  // namespace
 
 std::unique_ptr<IEnvelope> OpenVersion2(TOpening const& opening, TWay const& way) {
-  if (::ipmi_check_authentication_capabilities_ipmi_2_0(opening.contact.capabilities.Object()) != 1)
+  if (::ipmi_check_authentication_capabilities_ipmi_2_0(opening.fContact.fCapabilities.Object()) != 1)
     throw TFailure{kIpmiClientRefused, TFailure::kNoVersion2};
   Checked(::ipmi_rmcpplus_init());
   TOpening2 steps(opening, way);

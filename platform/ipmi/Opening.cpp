@@ -18,14 +18,14 @@ namespace {
 // Some controllers have only accounts without a name, or only accounts without a password.
 void CheckAccounts(TContact const& contact, TTarget const& target) {
   auto const given = [](std::string const& text) { return text.empty() ? nullptr : text.c_str(); };
-  fiid_obj_t const capabilities = contact.capabilities.Object();
-  if (::ipmi_check_authentication_capabilities_username(given(target.user), given(target.password), capabilities) != 1)
+  fiid_obj_t const capabilities = contact.fCapabilities.Object();
+  if (::ipmi_check_authentication_capabilities_username(given(target.fUser), given(target.fPassword), capabilities) != 1)
     throw TFailure{kIpmiClientUnknownUser};
 }
 
 }  // namespace
 
-TTarget::~TTarget() { ::explicit_bzero(password.data(), password.size()); }
+TTarget::~TTarget() { ::explicit_bzero(fPassword.data(), fPassword.size()); }
 
 std::uint32_t RandomNumber() {
   std::uint32_t number = 0;
@@ -45,34 +45,34 @@ TContact MakeContact(TLink& link, TWaits const& waits, TClock::time_point deadli
   TReply reply;
   TClock::time_point answered;
   auto const ask = [&] {
-    message.sequence = link.NextSequence();
-    sent[message.sequence] = TClock::now();
+    message.fSequence = link.NextSequence();
+    sent[message.fSequence] = TClock::now();
     return envelope.Pack(message);
   };
   auto const judge = [&](TPacket const& packet) {
     EVerdict const verdict = envelope.Unpack(packet, reply);
     if (verdict != EVerdict::kAnswer) return verdict;
-    message.sequence = reply.sequence;
-    if (sent.count(reply.sequence) == 0 || !IsAnswerTo(message, reply)) return EVerdict::kOther;
+    message.fSequence = reply.fSequence;
+    if (sent.count(reply.fSequence) == 0 || !IsAnswerTo(message, reply)) return EVerdict::kOther;
     answered = TClock::now();
     return EVerdict::kAnswer;
   };
   Exchange(link, {ask, judge}, waits, deadline);
-  if (reply.completionCode != IPMI_COMP_CODE_COMMAND_SUCCESS) throw TFailure{kIpmiClientFail};
+  if (reply.fCompletionCode != IPMI_COMP_CODE_COMMAND_SUCCESS) throw TFailure{kIpmiClientFail};
   return {FieldsOf(tmpl_cmd_get_channel_authentication_capabilities_rs, reply),
-          std::chrono::ceil<std::chrono::milliseconds>(answered - sent[reply.sequence])};
+          std::chrono::ceil<std::chrono::milliseconds>(answered - sent[reply.fSequence])};
 }
 
 std::unique_ptr<IEnvelope> OpenSession(TOpening const& opening, TWay const& way) {
-  CheckAccounts(opening.contact, opening.target);
-  return way.version == TWay::kVersion15 ? OpenVersion15(opening) : OpenVersion2(opening, way);
+  CheckAccounts(opening.fContact, opening.fTarget);
+  return way.fVersion == TWay::kVersion15 ? OpenVersion15(opening) : OpenVersion2(opening, way);
 }
 
 void RaisePrivilege(TLink& link, IEnvelope& envelope, TWaits const& waits, TClock::time_point deadline) {
   TFields request(tmpl_cmd_set_session_privilege_level_rq);
   Checked(::fill_cmd_set_session_privilege_level(IPMI_PRIVILEGE_LEVEL_ADMIN, request.Object()));
   TReply const reply = Ask(link, envelope, MessageOf(IPMI_NET_FN_APP_RQ, link.NextSequence(), request), waits, deadline);
-  switch (reply.completionCode) {
+  switch (reply.fCompletionCode) {
     case IPMI_COMP_CODE_COMMAND_SUCCESS:
       return;
     case IPMI_COMP_CODE_SET_SESSION_PRIVILEGE_LEVEL_REQUESTED_LEVEL_NOT_AVAILABLE_FOR_USER:

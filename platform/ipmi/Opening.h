@@ -7,32 +7,32 @@ namespace ipmi {
 
 // The controller and the account. The password is wiped by the destructor.
 struct TTarget {
-  std::string host, port, user, password;
+  std::string fHost, fPort, fUser, fPassword;
 
   ~TTarget();
 };
 
 // The answer to the first query, outside of a session: the versions that the controller supports.
 struct TContact {
-  TFields capabilities;                  // tmpl_cmd_get_channel_authentication_capabilities_rs
-  std::chrono::milliseconds answerTime;  // from the query to its answer
+  TFields fCapabilities;                  // tmpl_cmd_get_channel_authentication_capabilities_rs
+  std::chrono::milliseconds fAnswerTime;  // from the query to its answer
 };
 TContact MakeContact(TLink& link, TWaits const& waits, TClock::time_point deadline);
 
 // The parameters of opening a session.
 struct TOpening {
-  TLink& link;
-  TTarget const& target;
-  TContact const& contact;
-  TWaits waits;  // of each step
-  TClock::time_point deadline;
+  TLink& fLink;
+  TTarget const& fTarget;
+  TContact const& fContact;
+  TWaits fWaits;  // of each step
+  TClock::time_point fDeadline;
 };
 
 // How a session is opened.
 struct TWay {
-  enum EVersion { kVersion2, kVersion15 } version;
-  unsigned char cipherSuite;
-  bool namesPrivilege;  // in the request for a session
+  enum EVersion { kVersion2, kVersion15 } fVersion;
+  unsigned char fCipherSuite;
+  bool fNamesPrivilege;  // in the request for a session
 };
 
 // Opens a session. The envelope refers to the target's password. Throws TFailure; the controller may nevertheless have opened a

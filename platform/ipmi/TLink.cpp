@@ -65,19 +65,19 @@ std::vector<TAddress> AddressesOf(std::string const& host, std::string const& po
   std::vector<TAddress> addresses;
   for (addrinfo const* entry = first; entry != nullptr; entry = entry->ai_next) {
     TAddress& address = addresses.emplace_back();
-    address.size = entry->ai_addrlen;
-    std::memcpy(&address.address, entry->ai_addr, entry->ai_addrlen);
+    address.fSize = entry->ai_addrlen;
+    std::memcpy(&address.fAddress, entry->ai_addr, entry->ai_addrlen);
   }
   return addresses;
 }
 
-TLink::TLink(TAddress const& address) : fAddress(address), fSocket(UnconnectedSocket(address.address.ss_family)) {}
+TLink::TLink(TAddress const& address) : fAddress(address), fSocket(UnconnectedSocket(address.fAddress.ss_family)) {}
 
 void TLink::Send(TPacket const& packet) {
   // A refusal of an earlier packet is reported by the next call, which then does nothing else: hence the second one.
   for (int attempt = 0; attempt < 2; ++attempt) {
-    auto const* const address = reinterpret_cast<sockaddr const*>(&fAddress.address);
-    if (::sendto(fSocket.get(), packet.data(), packet.size(), MSG_NOSIGNAL, address, fAddress.size) >= 0) return;
+    auto const* const address = reinterpret_cast<sockaddr const*>(&fAddress.fAddress);
+    if (::sendto(fSocket.get(), packet.data(), packet.size(), MSG_NOSIGNAL, address, fAddress.fSize) >= 0) return;
     if (errno == ECONNREFUSED) fIsRefused = true;
   }
   bool const isLost = errno == ECONNREFUSED || errno == ENOBUFS || errno == EAGAIN || errno == EINTR;
@@ -114,10 +114,10 @@ void Exchange(TLink& link, TExchange const& exchange, TWaits const& waits, TCloc
   bool hasNonsense = false;
   for (auto const wait : waits) {
     if (TClock::now() >= deadline || link.NobodyListens()) break;
-    link.Send(exchange.request());
+    link.Send(exchange.fRequest());
     TClock::time_point const until = std::min(TClock::now() + wait, deadline);
     while (auto const packet = link.Receive(until)) {
-      EVerdict const verdict = exchange.judge(*packet);
+      EVerdict const verdict = exchange.fJudge(*packet);
       if (verdict == EVerdict::kAnswer) return;
       hasNonsense = hasNonsense || verdict == EVerdict::kNonsense;
     }

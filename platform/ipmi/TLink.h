@@ -18,8 +18,8 @@ using TClock = std::chrono::steady_clock;
 using TPacket = std::vector<unsigned char>;
 
 struct TAddress {
-  sockaddr_storage address;
-  socklen_t size;
+  sockaddr_storage fAddress;
+  socklen_t fSize;
 };
 
 // The addresses of a host, at least one. Throws TFailure: kIpmiClientHostUnknown, or kIpmiClientBadArgument for a port that is
@@ -69,8 +69,8 @@ enum class EVerdict {
 using TWaits = std::vector<std::chrono::milliseconds>;
 
 struct TExchange {
-  std::function<TPacket()> request;  // called for each sending
-  std::function<EVerdict(TPacket const&)> judge;
+  std::function<TPacket()> fRequest;  // called for each sending
+  std::function<EVerdict(TPacket const&)> fJudge;
 };
 
 // Sends the request repeatedly until `judge` recognises its answer; other packets are skipped. Throws TFailure when no answer

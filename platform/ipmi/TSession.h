@@ -8,17 +8,17 @@ namespace ipmi {
 // How long each step waits, in milliseconds. The library uses the defaults; ipmiClient.h documents the resulting limits.
 struct TTimes {
   // The first query changes nothing: it is sent often, and its answer is awaited for a long time.
-  TWaits contact = {kOften, kOften, kOften, kOften, kOften, kOften, kOften, kLong};
+  TWaits fContact = {kOften, kOften, kOften, kOften, kOften, kOften, kOften, kLong};
 
   // The later waits also last a second longer than the answer to the first query took.
-  std::chrono::milliseconds beyondContact{1000};
+  std::chrono::milliseconds fBeyondContact{1000};
   // A step of the opening: the controller may calculate for a long time, and starts again for each copy of the request.
-  TWaits step = {kLong, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore};
-  TWaits command = TWaits(6, kLong);  // a slow controller must not receive a command twice
-  TWaits close = TWaits(3, kOften);
+  TWaits fStep = {kLong, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore, kOnceMore};
+  TWaits fCommand = TWaits(6, kLong);  // a slow controller must not receive a command twice
+  TWaits fClose = TWaits(3, kOften);
 
-  std::chrono::milliseconds wholeOpening{60000}, wholeCommand{30000};
-  std::chrono::milliseconds idle{20000};  // well before controllers close an idle session
+  std::chrono::milliseconds fWholeOpening{60000}, fWholeCommand{30000};
+  std::chrono::milliseconds fIdle{20000};  // well before controllers close an idle session
 
   static constexpr std::chrono::milliseconds kOften{500}, kOnceMore{1000}, kLong{3500};
 };
@@ -38,7 +38,7 @@ public:
   TReply Send(unsigned char netFn, unsigned char command, TByteVector const& request);
 
 private:
-  bool IsIdle() const { return TClock::now() - fLastAnswer > fTimes.idle; }
+  bool IsIdle() const { return TClock::now() - fLastAnswer > fTimes.fIdle; }
   TWaits Lengthened(TWaits const& waits) const;
   TContact Reach(TClock::time_point deadline);
   TReply AskInSession(unsigned char netFn, unsigned char command, TByteVector const& request, TClock::time_point deadline);

@@ -30,15 +30,15 @@ constexpr std::size_t kMaxFileSize = 16u << 20;
 
 // The contents of a file, and the table in them.
 struct TTableFile {
-  std::string contents;
-  std::string_view table;  // into `contents`
+  std::string fContents;
+  std::string_view fTable;  // into fContents
 };
 using TSharedTableFile = std::shared_ptr<TTableFile const>;
 
 // An open handle: the file, and the position after the structure that was copied last.
 struct THandle {
-  TSharedTableFile file;
-  smbios::TStructureReader place;
+  TSharedTableFile fFile;
+  smbios::TStructureReader fPlace;
 };
 
 char const* TablePath() {
@@ -113,8 +113,8 @@ int ReadTableFile(char const* path, TSharedTableFile& tableFile) {
   if (::fstat(file.get(), &status) != 0) return kSmbiosFileSystemError;
   if (!S_ISREG(status.st_mode)) return kSmbiosFail;
   auto const whole = std::make_shared<TTableFile>();
-  if (!ReadWhole(file.get(), static_cast<std::size_t>(status.st_size), whole->contents)) return kSmbiosFileSystemError;
-  whole->table = smbios::DmiTableIn(whole->contents);
+  if (!ReadWhole(file.get(), static_cast<std::size_t>(status.st_size), whole->fContents)) return kSmbiosFileSystemError;
+  whole->fTable = smbios::DmiTableIn(whole->fContents);
   tableFile = whole;
   LastFile().Keep(status, tableFile);
   return kSmbiosOk;
@@ -122,9 +122,9 @@ int ReadTableFile(char const* path, TSharedTableFile& tableFile) {
 
 int Load(void** handle) {
   auto loaded = std::make_unique<THandle>();
-  if (int const status = ReadTableFile(TablePath(), loaded->file); status != kSmbiosOk) return status;
-  if (loaded->file->table.empty()) return kSmbiosFail;
-  loaded->place = smbios::TStructureReader(loaded->file->table);
+  if (int const status = ReadTableFile(TablePath(), loaded->fFile); status != kSmbiosOk) return status;
+  if (loaded->fFile->fTable.empty()) return kSmbiosFail;
+  loaded->fPlace = smbios::TStructureReader(loaded->fFile->fTable);
   *handle = loaded.release();
   return kSmbiosOk;
 }
@@ -134,7 +134,7 @@ int CopyNextOfType(THandle& handle, smbios::TStructureReader place, int type, vo
   smbios::TStructure const structure = place.NextOfType(type);
   if (structure.empty()) return kSmbiosNoMoreItems;
 
-  handle.place = place;
+  handle.fPlace = place;
   if (*length > 0) std::memcpy(buffer, structure.data(), std::min(structure.size(), static_cast<std::size_t>(*length)));
   *length = static_cast<int>(structure.size());
   return kSmbiosOk;
@@ -155,13 +155,13 @@ int smBiosLoad(void* /*provider*/, void** handle) try {
 int smBiosGetFirst(void* handle, int type, void* buffer, int* length) {
   if (handle == nullptr) return kSmbiosFail;
   THandle& opened = *static_cast<THandle*>(handle);
-  return CopyNextOfType(opened, smbios::TStructureReader(opened.file->table), type, buffer, length);
+  return CopyNextOfType(opened, smbios::TStructureReader(opened.fFile->fTable), type, buffer, length);
 }
 
 int smBiosGetNext(void* handle, int type, void* buffer, int* length) {
   if (handle == nullptr) return kSmbiosFail;
   THandle& opened = *static_cast<THandle*>(handle);
-  return CopyNextOfType(opened, opened.place, type, buffer, length);
+  return CopyNextOfType(opened, opened.fPlace, type, buffer, length);
 }
 
 int smBiosClose(void* handle) {

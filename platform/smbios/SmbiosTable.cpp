@@ -41,12 +41,12 @@ bool IsSumZero(std::string_view bytes) {
 
 // The offsets of the entry point's fields that are read here. All of them are within `minLength` bytes.
 struct TEntryPointLayout {
-  std::string_view anchor;
-  std::size_t minLength, maxLength;  // allowed values of the length byte
-  std::size_t lengthOffset;
-  std::size_t tableSizeOffset, tableSizeBytes;
-  std::size_t tableAddressOffset, tableAddressBytes;
-  bool hasInnerPart;  // the inner part has its own anchor and checksum
+  std::string_view fAnchor;
+  std::size_t fMinLength, fMaxLength;  // allowed values of the length byte
+  std::size_t fLengthOffset;
+  std::size_t fTableSizeOffset, fTableSizeBytes;
+  std::size_t fTableAddressOffset, fTableAddressBytes;
+  bool fHasInnerPart;  // the inner part has its own anchor and checksum
 };
 
 // Some firmware is known to give the length 0x1E where 0x1F is correct.
@@ -66,14 +66,14 @@ std::string_view TableAt(std::string_view file, std::uint64_t address, std::size
 }
 
 std::string_view TableNamedBy(TEntryPointLayout const& layout, std::string_view file) {
-  if (file.size() < layout.maxLength) return {};  // no room for a table after it
-  std::size_t const length = ByteAt(file, layout.lengthOffset);
-  if (length < layout.minLength || length > layout.maxLength) return {};
+  if (file.size() < layout.fMaxLength) return {};  // no room for a table after it
+  std::size_t const length = ByteAt(file, layout.fLengthOffset);
+  if (length < layout.fMinLength || length > layout.fMaxLength) return {};
   if (!IsSumZero(file.substr(0, length))) return {};
-  if (layout.hasInnerPart && !IsInnerPartSound(file)) return {};
+  if (layout.fHasInnerPart && !IsInnerPartSound(file)) return {};
 
-  std::uint64_t const address = NumberAt(file, layout.tableAddressOffset, layout.tableAddressBytes);
-  return TableAt(file, address, length, NumberAt(file, layout.tableSizeOffset, layout.tableSizeBytes));
+  std::uint64_t const address = NumberAt(file, layout.fTableAddressOffset, layout.fTableAddressBytes);
+  return TableAt(file, address, length, NumberAt(file, layout.fTableSizeOffset, layout.fTableSizeBytes));
 }
 
 // The length of an entry point older than SMBIOS 2.1, which has no length byte.
@@ -105,8 +105,8 @@ TStructure TStructureReader::NextOfType(int type) {
 }
 
 std::string_view DmiTableIn(std::string_view file) {
-  if (StartsWith(file, kEntryPoint64.anchor)) return TableNamedBy(kEntryPoint64, file);
-  if (StartsWith(file, kEntryPoint32.anchor)) return TableNamedBy(kEntryPoint32, file);
+  if (StartsWith(file, kEntryPoint64.fAnchor)) return TableNamedBy(kEntryPoint64, file);
+  if (StartsWith(file, kEntryPoint32.fAnchor)) return TableNamedBy(kEntryPoint32, file);
   if (BeginsWithLegacyEntryPoint(file)) return TableNamedByLegacy(file);
   return file;
 }

@@ -45,15 +45,15 @@ std::uint32_t NumberOf(sockaddr const* address) {
   return ntohl(version4.sin_addr.s_addr);
 }
 
-bool IsLinkLocal(TAddress const& address) { return address.address >> 16 == AddressOf(169, 254, 0, 0) >> 16; }
+bool IsLinkLocal(TAddress const& address) { return address.fAddress >> 16 == AddressOf(169, 254, 0, 0) >> 16; }
 
 bool IsController(std::vector<TInterface>::value_type const& interface, std::string const& classNet) {
-  return IsUsbNetwork(classNet, interface.name) &&
-         std::all_of(interface.addresses.begin(), interface.addresses.end(), IsLinkLocal);
+  return IsUsbNetwork(classNet, interface.fName) &&
+         std::all_of(interface.fAddresses.begin(), interface.fAddresses.end(), IsLinkLocal);
 }
 
 TInterface InterfaceNamed(std::string const& name, std::vector<TInterface> const& all) {
-  auto const found = std::find_if(all.begin(), all.end(), [&](TInterface const& interface) { return interface.name == name; });
+  auto const found = std::find_if(all.begin(), all.end(), [&](TInterface const& interface) { return interface.fName == name; });
   return found != all.end() ? *found : TInterface{name, false, {}, false};
 }
 
@@ -67,37 +67,37 @@ std::vector<TInterface> Named(std::vector<TInterface> const& all, std::string co
 
 // The request to add an address, in the form of the kernel's route socket.
 struct TNewAddress {
-  nlmsghdr header;
-  ifaddrmsg message;
+  nlmsghdr fHeader;
+  ifaddrmsg fMessage;
   struct {
-    rtattr head;
-    std::uint32_t address;  // in network byte order
-  } local, own;
+    rtattr fHead;
+    std::uint32_t fAddress;  // in network byte order
+  } fLocal, fOwn;
 };
 
 TNewAddress NewAddress(unsigned interface, std::uint32_t address) {
   TNewAddress request{};
-  request.header.nlmsg_len = sizeof request;
-  request.header.nlmsg_type = RTM_NEWADDR;
-  request.header.nlmsg_flags = NLM_F_REQUEST | NLM_F_ACK | NLM_F_CREATE | NLM_F_EXCL;
-  request.message.ifa_family = AF_INET;
-  request.message.ifa_prefixlen = kPrefixLength;
-  request.message.ifa_scope = RT_SCOPE_LINK;
-  request.message.ifa_index = interface;
-  request.local = {{sizeof request.local, IFA_LOCAL}, htonl(address)};
-  request.own = {{sizeof request.own, IFA_ADDRESS}, htonl(address)};
+  request.fHeader.nlmsg_len = sizeof request;
+  request.fHeader.nlmsg_type = RTM_NEWADDR;
+  request.fHeader.nlmsg_flags = NLM_F_REQUEST | NLM_F_ACK | NLM_F_CREATE | NLM_F_EXCL;
+  request.fMessage.ifa_family = AF_INET;
+  request.fMessage.ifa_prefixlen = kPrefixLength;
+  request.fMessage.ifa_scope = RT_SCOPE_LINK;
+  request.fMessage.ifa_index = interface;
+  request.fLocal = {{sizeof request.fLocal, IFA_LOCAL}, htonl(address)};
+  request.fOwn = {{sizeof request.fOwn, IFA_ADDRESS}, htonl(address)};
   return request;
 }
 
 // The kernel's result for a request that it has to acknowledge: 0 or an errno value.
 int AcknowledgedError(int socket) {
   struct {
-    nlmsghdr header;
-    nlmsgerr error;
-    char rest[512];
+    nlmsghdr fHeader;
+    nlmsgerr fError;
+    char fRest[512];
   } answer{};
   if (::recv(socket, &answer, sizeof answer, 0) < 0) return errno;
-  return answer.header.nlmsg_type == NLMSG_ERROR ? -answer.error.error : EPROTO;
+  return answer.fHeader.nlmsg_type == NLMSG_ERROR ? -answer.fError.error : EPROTO;
 }
 
 }  // namespace
@@ -114,10 +114,10 @@ std::vector<TInterface> AllInterfaces() {
   for (ifaddrs const* entry = first; entry != nullptr; entry = entry->ifa_next) {
     std::string const name = entry->ifa_name;
     TInterface& interface = byName[name.substr(0, name.find(':'))];  // without the label of the address
-    interface.name = name.substr(0, name.find(':'));
-    interface.isUp = (entry->ifa_flags & IFF_UP) != 0;
+    interface.fName = name.substr(0, name.find(':'));
+    interface.fIsUp = (entry->ifa_flags & IFF_UP) != 0;
     if (entry->ifa_addr != nullptr && entry->ifa_addr->sa_family == AF_INET && entry->ifa_netmask != nullptr)
-      interface.addresses.push_back({NumberOf(entry->ifa_addr), NumberOf(entry->ifa_netmask)});
+      interface.fAddresses.push_back({NumberOf(entry->ifa_addr), NumberOf(entry->ifa_netmask)});
   }
   std::vector<TInterface> all;
   for (auto& [name, interface] : byName) all.push_back(std::move(interface));
@@ -145,13 +145,13 @@ std::vector<TInterface> ControllerInterfaces(std::vector<TInterface> const& all,
 bool Reaches(TInterface const& interface, int node) {
   std::uint32_t const controller = ControllerAddress(node);
   auto const reaches = [controller](TAddress const& own) {
-    return own.address != controller && (own.address & own.mask) == (controller & own.mask) && own.mask != 0;
+    return own.fAddress != controller && (own.fAddress & own.fMask) == (controller & own.fMask) && own.fMask != 0;
   };
-  return interface.isUp && std::any_of(interface.addresses.begin(), interface.addresses.end(), reaches);
+  return interface.fIsUp && std::any_of(interface.fAddresses.begin(), interface.fAddresses.end(), reaches);
 }
 
 void AddOwnAddress(TInterface const& interface, int node) {
-  unsigned const index = ::if_nametoindex(interface.name.c_str());
+  unsigned const index = ::if_nametoindex(interface.fName.c_str());
   if (index == 0) ThrowSystemError(ENODEV);
   TUniqueFd const socket = OpenSocket(AF_NETLINK, SOCK_RAW, NETLINK_ROUTE);
   TNewAddress const request = NewAddress(index, OwnAddress(node));
@@ -163,7 +163,7 @@ void AddOwnAddress(TInterface const& interface, int node) {
 void TakeUp(TInterface const& interface) {
   TUniqueFd const socket = OpenSocket(AF_INET, SOCK_DGRAM, 0);
   ifreq request{};
-  interface.name.copy(request.ifr_name, IFNAMSIZ - 1);
+  interface.fName.copy(request.ifr_name, IFNAMSIZ - 1);
   if (::ioctl(socket.get(), SIOCGIFFLAGS, &request) != 0) ThrowSystemError(errno);
   request.ifr_flags = static_cast<short>(request.ifr_flags | IFF_UP);
   if (::ioctl(socket.get(), SIOCSIFFLAGS, &request) != 0) ThrowSystemError(errno);

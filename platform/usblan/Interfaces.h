@@ -12,14 +12,14 @@ constexpr int kMaxNodes = 16;
 
 // An IPv4 address with its network, in host byte order.
 struct TAddress {
-  std::uint32_t address, mask;
+  std::uint32_t fAddress, fMask;
 };
 
 struct TInterface {
-  std::string name;
-  bool isUp = false;
-  std::vector<TAddress> addresses = {};
-  bool isThere = true;  // false: named, but missing on this machine
+  std::string fName;
+  bool fIsUp = false;
+  std::vector<TAddress> fAddresses = {};
+  bool fIsThere = true;  // false: named, but missing on this machine
 };
 
 // The controller's address of a node, and the address of this side; both are in one network of 24 bits.

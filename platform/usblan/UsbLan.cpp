@@ -26,7 +26,7 @@ int BringUp(int node) {
   std::vector<usblan::TInterface> const nodes = Nodes();
   if (!IsNode(nodes, node)) return ENODEV;
   usblan::TInterface const& interface = nodes[static_cast<std::size_t>(node)];
-  if (!interface.isThere) return ENODEV;
+  if (!interface.fIsThere) return ENODEV;
   if (usblan::Reaches(interface, node)) return 0;
   usblan::TakeUp(interface);
   usblan::AddOwnAddress(interface, node);

@@ -31,9 +31,9 @@ boost::shared_ptr<ICIMNamespace> Schema() {
 
 TEST(ClassTreeTest, EachClassComesAfterItsSuperclassWithItsKind) {
   struct TRow {
-    char const *name, *superClass;
-    bool isAbstract, isAssociation, isIndication;
-    std::size_t depth;
+    char const *fName, *fSuperClass;
+    bool fIsAbstract, fIsAssociation, fIsIndication;
+    std::size_t fDepth;
   } const rows[] = {
       {"X_Device", "", true, false, false, 0},      {"X_Disk", "X_Device", false, false, false, 1},
       {"X_Link", "", false, true, false, 0},        {"X_Alert", "", true, false, true, 0},
@@ -44,14 +44,14 @@ TEST(ClassTreeTest, EachClassComesAfterItsSuperclassWithItsKind) {
   for (std::size_t at = 0; at < entries.size(); ++at) {
     TClassEntry const& entry = entries[at];
     TRow const& row = rows[at];
-    SCOPED_TRACE(row.name);
-    EXPECT_EQ(entry.fName, row.name);
-    EXPECT_EQ(entry.fClass->GetName(TCIMContext()), row.name);
-    EXPECT_EQ(entry.fSuperClass, row.superClass);
-    EXPECT_EQ(entry.fIsAbstract, row.isAbstract);
-    EXPECT_EQ(entry.fIsAssociation, row.isAssociation);
-    EXPECT_EQ(entry.fIsIndication, row.isIndication);
-    EXPECT_EQ(entry.fDepth, row.depth);
+    SCOPED_TRACE(row.fName);
+    EXPECT_EQ(entry.fName, row.fName);
+    EXPECT_EQ(entry.fClass->GetName(TCIMContext()), row.fName);
+    EXPECT_EQ(entry.fSuperClass, row.fSuperClass);
+    EXPECT_EQ(entry.fIsAbstract, row.fIsAbstract);
+    EXPECT_EQ(entry.fIsAssociation, row.fIsAssociation);
+    EXPECT_EQ(entry.fIsIndication, row.fIsIndication);
+    EXPECT_EQ(entry.fDepth, row.fDepth);
   }
 }
 

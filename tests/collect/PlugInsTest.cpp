@@ -66,7 +66,7 @@ protected:
 TEST_F(PlugInDirectoryTest, APlugInThatFailsStopsNoOther) {
   std::string const broken = "plug-in Broken: " + fDir.Path("libBroken.nsp.so") + ": file too short\n";
   struct TRow {
-    char const *behaviour, *listed;
+    char const *fBehaviour, *fListed;
   } const rows[] = {
       {"works", "plug-in Test: \nprovider Test: filled root/test\n"},
       {"throws", "plug-in Test: \nprovider Test: kZEPStatusAccessDenied\n"},
@@ -74,7 +74,7 @@ TEST_F(PlugInDirectoryTest, APlugInThatFailsStopsNoOther) {
       {"no-namespace", "plug-in Test: \nprovider Test: it has no namespace\n"},
       {"is-silent", "plug-in Test: \n"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(List(row.behaviour), broken + row.listed) << row.behaviour;
+  for (TRow const& row : rows) EXPECT_EQ(List(row.fBehaviour), broken + row.fListed) << row.fBehaviour;
 }
 
 }  // namespace

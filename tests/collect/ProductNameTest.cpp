@@ -8,9 +8,9 @@ namespace {
 
 TEST(ProductNameTest, BracketsAreFoundAndRemoved) {
   struct TRow {
-    char const* name;
-    bool hasBrackets;
-    char const* without;
+    char const* fName;
+    bool fHasBrackets;
+    char const* fWithout;
   } const rows[] = {
       {"Server Q100 -[1234AB7]-", true, "Server Q100"},
       {"Server Q100", false, "Server Q100"},
@@ -22,8 +22,8 @@ TEST(ProductNameTest, BracketsAreFoundAndRemoved) {
       {"", false, ""},
   };
   for (TRow const& row : rows) {
-    EXPECT_EQ(HasBrackets(row.name), row.hasBrackets) << row.name;
-    EXPECT_EQ(WithoutBrackets(row.name), row.without) << row.name;
+    EXPECT_EQ(HasBrackets(row.fName), row.fHasBrackets) << row.fName;
+    EXPECT_EQ(WithoutBrackets(row.fName), row.fWithout) << row.fName;
   }
 }
 

@@ -8,7 +8,7 @@ namespace {
 
 TEST(SafeTextTest, CharactersThatControlATerminalAreEscaped) {
   struct TRow {
-    std::string text, printable;
+    std::string fText, fPrintable;
   } const rows[] = {
       {"plain text, 100 %", "plain text, 100 %"},
       {"", ""},
@@ -39,7 +39,7 @@ TEST(SafeTextTest, CharactersThatControlATerminalAreEscaped) {
       {"\xf4\x90\x80\x80", "\\xf4\\x90\\x80\\x80"},  // beyond the last character
       {"\x80", "\\x80"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(Printable(row.text), row.printable) << testing::PrintToString(row.text);
+  for (TRow const& row : rows) EXPECT_EQ(Printable(row.fText), row.fPrintable) << testing::PrintToString(row.fText);
 }
 
 TEST(SafeTextTest, OnlyZeroBytesAndBytesThatAreNotUtf8AreEscaped) {

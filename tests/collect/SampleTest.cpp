@@ -20,15 +20,15 @@ TEST(SampleTest, ProvidersFindTheSampleInTheEnvironment) {
 
 TEST(SampleTest, SourcesAreLabelledOnlyWithASample) {
   struct TRow {
-    char const *source, *labelled;
+    char const *fSource, *fLabelled;
   } const rows[] = {
       {"ZEP_HOST_NAME", "SAMPLE"},
       {"SMBIOS type 1 (file)", "SAMPLE, SMBIOS type 1"},
       {"/etc/os-release", "/etc/os-release (not of the sample)"},
   };
   for (TRow const& row : rows) {
-    EXPECT_EQ(LabelledSource(row.source, "SAMPLE"), row.labelled);
-    EXPECT_EQ(LabelledSource(row.source, ""), row.source);
+    EXPECT_EQ(LabelledSource(row.fSource, "SAMPLE"), row.fLabelled);
+    EXPECT_EQ(LabelledSource(row.fSource, ""), row.fSource);
   }
 }
 

@@ -64,17 +64,17 @@ TEST_F(TNamespaceViewTest, AClassWithoutInstancesHasTheReasonOfTheProvider) {
 
 TEST_F(TNamespaceViewTest, WithoutAReasonTheReasonIsGeneral) {
   struct TRow {
-    TAnswer<TCIMValue> answer;
-    char const *code, *reason;
+    TAnswer<TCIMValue> fAnswer;
+    char const *fCode, *fReason;
   };
   TNamespaceView const view = View();
   auto const note = fNamespace->AddInstance("X_Note", {});
   for (TRow const& row : {TRow{view.AnswerOfFirst("X_None", "Text"), "not-described", "no provider describes it"},
                           TRow{view.Answer(*note, "Text"), "not-given", "the provider gives no value"},
                           TRow{view.Answer(*note, "Colour"), "not-given", "the provider knows no property Colour"}}) {
-    EXPECT_FALSE(row.answer.IsKnown());
-    EXPECT_EQ(row.answer.fMissing.fCode, row.code);
-    EXPECT_EQ(row.answer.fMissing.fReason, row.reason);
+    EXPECT_FALSE(row.fAnswer.IsKnown());
+    EXPECT_EQ(row.fAnswer.fMissing.fCode, row.fCode);
+    EXPECT_EQ(row.fAnswer.fMissing.fReason, row.fReason);
   }
 }
 

@@ -46,12 +46,12 @@ TEST_F(TValueWordsTest, RangesHaveAWordToo) {
   TValueWords const words =
       Words({"..7", "9", "10..20", "15", "0x8000..0xFFFF", ".."}, {"low", "nine", "teens", "never", "vendor", "rest"});
   struct TRow {
-    int value;
-    char const* word;
+    int fValue;
+    char const* fWord;
   };
   for (TRow const& row : {TRow{0, "low"}, TRow{7, "low"}, TRow{8, "rest"}, TRow{9, "nine"}, TRow{10, "teens"}, TRow{15, "teens"},
                           TRow{20, "teens"}, TRow{21, "rest"}, TRow{0x8000, "vendor"}, TRow{65535, "vendor"}})
-    EXPECT_EQ(words.WordFor(Uint16(row.value)), row.word) << row.value;
+    EXPECT_EQ(words.WordFor(Uint16(row.fValue)), row.fWord) << row.fValue;
 }
 
 TEST_F(TValueWordsTest, NumbersAreComparedExactly) {

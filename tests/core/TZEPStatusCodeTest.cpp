@@ -12,9 +12,9 @@ namespace NQRVZEP20 {
 namespace {
 
 struct TRow {
-  int value;
-  EZEPStatusCode code;
-  char const* name;
+  int fValue;
+  EZEPStatusCode fCode;
+  char const* fName;
 };
 
 TRow const kAllCodes[] = {
@@ -67,11 +67,11 @@ TRow const kAllCodes[] = {
 TEST(TZEPStatusCodeTest, EveryCodeHasItsNumberAndItsNameAsText) {
   int expected = 0;
   for (TRow const& row : kAllCodes) {
-    SCOPED_TRACE(row.name);
-    EXPECT_EQ(row.value, expected++);
-    EXPECT_EQ(static_cast<int>(row.code), row.value);
-    EXPECT_EQ(TZEPStatusCode(row.code).TranslateStatusCode(), row.name);
-    EXPECT_STREQ(TZEPException(row.code).what(), row.name);
+    SCOPED_TRACE(row.fName);
+    EXPECT_EQ(row.fValue, expected++);
+    EXPECT_EQ(static_cast<int>(row.fCode), row.fValue);
+    EXPECT_EQ(TZEPStatusCode(row.fCode).TranslateStatusCode(), row.fName);
+    EXPECT_STREQ(TZEPException(row.fCode).what(), row.fName);
   }
   EXPECT_EQ(expected, 44);
 }

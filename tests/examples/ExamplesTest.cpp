@@ -127,7 +127,7 @@ TEST(ListProviderTest, EndsInTheStatusOfAPlugInThatDoesNotLoad) {
 // ---- The documentation ----
 
 struct TBlock {
-  std::string language, text;
+  std::string fLanguage, fText;
 };
 
 // The fenced blocks of a document, in their order.
@@ -140,7 +140,7 @@ std::vector<TBlock> BlocksOf(std::string const& document) {
     if (isFence && !isInside)
       blocks.push_back({line.substr(3), ""});
     else if (!isFence && isInside)
-      blocks.back().text += line + "\n";
+      blocks.back().fText += line + "\n";
     isInside = isInside != isFence;
   }
   return blocks;
@@ -148,14 +148,14 @@ std::vector<TBlock> BlocksOf(std::string const& document) {
 
 std::string FirstBlockOf(std::string const& document, std::string const& language) {
   for (TBlock const& block : BlocksOf(document))
-    if (block.language == language) return block.text;
+    if (block.fLanguage == language) return block.fText;
   return "";
 }
 
 std::vector<TBlock> BlocksOf(std::string const& document, std::string const& language) {
   std::vector<TBlock> blocks;
   for (TBlock const& block : BlocksOf(document))
-    if (block.language == language) blocks.push_back(block);
+    if (block.fLanguage == language) blocks.push_back(block);
   return blocks;
 }
 
@@ -166,9 +166,9 @@ void ExpectBlocksFrom(std::vector<TBlock> const& blocks, std::size_t first, std:
   ASSERT_LE(last, blocks.size());
   std::size_t position = 0;
   for (std::size_t at = first; at < last; ++at) {
-    std::size_t const found = source.find(blocks[at].text, position);
-    ASSERT_NE(found, std::string::npos) << "not in " << sourceName << ":\n" << blocks[at].text;
-    position = found + blocks[at].text.size();
+    std::size_t const found = source.find(blocks[at].fText, position);
+    ASSERT_NE(found, std::string::npos) << "not in " << sourceName << ":\n" << blocks[at].fText;
+    position = found + blocks[at].fText.size();
   }
 }
 

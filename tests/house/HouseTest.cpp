@@ -19,8 +19,8 @@ namespace {
 namespace fs = std::filesystem;
 
 struct TRoom {
-  char const* folder;
-  std::vector<std::string> mayInclude;  // the rooms whose headers it may include, besides itself
+  char const* fFolder;
+  std::vector<std::string> fMayInclude;  // the rooms whose headers it may include, besides itself
 };
 
 TRoom const kRooms[] = {
@@ -72,7 +72,7 @@ std::vector<std::string> QuotedIncludesOf(fs::path const& source) {
 std::string RoomOf(fs::path folder) {
   for (; !folder.empty(); folder = folder.parent_path())
     for (TRoom const& room : kRooms)
-      if (folder == room.folder) return room.folder;
+      if (folder == room.fFolder) return room.fFolder;
   return "nowhere";
 }
 
@@ -89,9 +89,9 @@ std::string RoomNamedBy(std::string const& include, fs::path const& source) {
 TEST(HouseTest, RoomsIncludeOnlyTheRoomsTheyMay) {
   int checked = 0;
   for (TRoom const& room : kRooms) {
-    std::set<std::string> allowed(room.mayInclude.begin(), room.mayInclude.end());
-    allowed.insert(room.folder);
-    for (fs::path const& source : SourcesOf(room.folder))
+    std::set<std::string> allowed(room.fMayInclude.begin(), room.fMayInclude.end());
+    allowed.insert(room.fFolder);
+    for (fs::path const& source : SourcesOf(room.fFolder))
       for (std::string const& include : QuotedIncludesOf(source)) {
         std::string const named = RoomNamedBy(include, source);
         EXPECT_TRUE(allowed.count(named)) << source << " includes \"" << include << "\", which is of " << named;
@@ -104,7 +104,7 @@ TEST(HouseTest, RoomsIncludeOnlyTheRoomsTheyMay) {
 // ---- Tests and their sources ----
 
 struct TTestWithoutSource {
-  char const *path, *reason;
+  char const *fPath, *fReason;
 };
 
 TTestWithoutSource const kTestsWithoutSource[] = {
@@ -127,7 +127,7 @@ TTestWithoutSource const kTestsWithoutSource[] = {
 
 char const* ReasonForNoSource(fs::path const& test) {
   for (TTestWithoutSource const& known : kTestsWithoutSource)
-    if (test == known.path) return known.reason;
+    if (test == known.fPath) return known.fReason;
   return nullptr;
 }
 
@@ -145,17 +145,17 @@ bool HasSource(fs::path const& test) {
 TEST(HouseTest, EveryTestOfARoomHasASourceOfItsName) {
   int checked = 0;
   for (TRoom const& room : kRooms)
-    for (fs::path const& path : SourcesOf("tests/" + std::string(room.folder))) {
+    for (fs::path const& path : SourcesOf("tests/" + std::string(room.fFolder))) {
       fs::path const test = fs::relative(path, kSource / "tests");
       std::string const name = test.filename().string();
       bool const isTest = name.size() > 8 && name.compare(name.size() - 8, 8, "Test.cpp") == 0;
-      if (!isTest || RoomOf(test.parent_path()) != room.folder) continue;
+      if (!isTest || RoomOf(test.parent_path()) != room.fFolder) continue;
       EXPECT_NE(HasSource(test), ReasonForNoSource(test) != nullptr) << test;
       ++checked;
     }
   EXPECT_GT(checked, 80);
   for (TTestWithoutSource const& known : kTestsWithoutSource)
-    EXPECT_TRUE(fs::exists(kSource / "tests" / known.path)) << known.path << ", " << known.reason;
+    EXPECT_TRUE(fs::exists(kSource / "tests" / known.fPath)) << known.fPath << ", " << known.fReason;
 }
 
 TEST(HouseTest, ZepcoreHeaderIncludesEveryPublicHeader) {

@@ -21,10 +21,10 @@ using namespace std::string_literals;
 
 TEST(GenSumTest, IsTheTwosComplementOfTheSum) {
   struct TRow {
-    char const* what;
-    std::string bytes;
-    int first, last;
-    int sum;
+    char const* fWhat;
+    std::string fBytes;
+    int fFirst, fLast;
+    int fSum;
   };
   TRow const rows[] = {
       {"responder address and network function", "\x20\x18"s, 0, 1, 0xC8},
@@ -39,8 +39,8 @@ TEST(GenSumTest, IsTheTwosComplementOfTheSum) {
   };
   IIPMILan& link = *IIPMILan::Initialize();
   for (TRow row : rows) {
-    SCOPED_TRACE(row.what);
-    EXPECT_EQ(static_cast<unsigned char>(link.GenSum(row.bytes.data(), row.first, row.last)), row.sum);
+    SCOPED_TRACE(row.fWhat);
+    EXPECT_EQ(static_cast<unsigned char>(link.GenSum(row.fBytes.data(), row.fFirst, row.fLast)), row.fSum);
   }
 }
 
@@ -87,9 +87,9 @@ bool Check(IIPMILan& link, std::string const& packet, int lengthPosition, int mo
 
 TEST(ChkResponseTest, EachModeTestsOnlyItsOwnParts) {
   struct TRow {
-    bool isChecksumRight;
-    int completionCode;
-    bool results[5];  // for the modes 0, 1, 2, 3 and -1
+    bool fIsChecksumRight;
+    int fCompletionCode;
+    bool fResults[5];  // for the modes 0, 1, 2, 3 and -1
   };
   TRow const rows[] = {
       {true, 0, {true, true, true, true, true}},
@@ -102,14 +102,14 @@ TEST(ChkResponseTest, EachModeTestsOnlyItsOwnParts) {
     for (TRow const& row : rows)
       for (int m = 0; m < 5; ++m) {
         SCOPED_TRACE(testing::Message() << "authentication " << static_cast<int>(authentication) << ", checksum "
-                                        << row.isChecksumRight << ", code " << row.completionCode << ", mode " << modes[m]);
-        std::string packet = Packet(authentication, row.completionCode,
+                                        << row.fIsChecksumRight << ", code " << row.fCompletionCode << ", mode " << modes[m]);
+        std::string packet = Packet(authentication, row.fCompletionCode,
                                     "\x03"
                                     "abc");
-        if (!row.isChecksumRight) ++packet.back();
+        if (!row.fIsChecksumRight) ++packet.back();
         IIPMILan& link = *IIPMILan::Initialize();
-        EXPECT_EQ(Check(link, packet, kLengthPosition, modes[m]), row.results[m]);
-        EXPECT_EQ(link.getipmiLanStatus(), row.results[m]) << "a success makes the status true";
+        EXPECT_EQ(Check(link, packet, kLengthPosition, modes[m]), row.fResults[m]);
+        EXPECT_EQ(link.getipmiLanStatus(), row.fResults[m]) << "a success makes the status true";
       }
 }
 
@@ -150,18 +150,18 @@ TEST(ChkResponseTest, EveryChangedByteOfTheMessageIsDetected) {
 // The message length is a signed byte. A negative length leads to bytes before the message and before the packet.
 TEST(ChkResponseTest, ANegativeLengthIsComparedWithAnEarlierByte) {
   struct TRow {
-    int length;
-    int place;  // offset of the byte that is compared with 0, the empty sum; negative: before the packet
+    int fLength;
+    int fPlace;  // offset of the byte that is compared with 0, the empty sum; negative: before the packet
   };
   TRow const rows[] = {{0, 13}, {-1, 12}, {-2, 11}, {-13, 0}, {-14, -1}, {-15, -2}, {-128, -115}};
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.length);
+    SCOPED_TRACE(row.fLength);
     for (bool isZero : {true, false}) {
       std::string packet(14, '\x5A');
       packet[4] = 0;
-      packet[13] = static_cast<char>(row.length);
-      if (row.place >= 0 && row.place != 13) packet[static_cast<std::size_t>(row.place)] = isZero ? 0 : 1;
-      bool const expected = row.place == 13 || (row.place >= 0 && isZero);
+      packet[13] = static_cast<char>(row.fLength);
+      if (row.fPlace >= 0 && row.fPlace != 13) packet[static_cast<std::size_t>(row.fPlace)] = isZero ? 0 : 1;
+      bool const expected = row.fPlace == 13 || (row.fPlace >= 0 && isZero);
       EXPECT_EQ(Check(*IIPMILan::Initialize(), packet, kLengthPosition, 1), expected);
     }
   }

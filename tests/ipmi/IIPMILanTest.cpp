@@ -150,10 +150,10 @@ TEST_F(IIPMILanTest, OpeningLogsThePasswordAndRemembersTheParameters) {
 TEST_F(IIPMILanTest, TheParametersAreStoredAfterTheCall) {
   std::vector<std::string> before;
   fLink->IpmilanOpenConnect("earlier", "one", "two");
-  fStandIn.atOpen = [&] { before = SessionParameters(); };
+  fStandIn.fAtOpen = [&] { before = SessionParameters(); };
   fLink->IpmilanOpenConnect("later", "three", "four");
   EXPECT_THAT(before, ElementsAre("earlier", "623", "one", "two"));
-  fStandIn.thrownByOpen = 9;
+  fStandIn.fThrownByOpen = 9;
   EXPECT_THROW(fLink->IpmilanOpenConnect("last", "five", "six"), int);
   EXPECT_THAT(SessionParameters(), ElementsAre("later", "623", "three", "four"));
 }
@@ -161,7 +161,7 @@ TEST_F(IIPMILanTest, TheParametersAreStoredAfterTheCall) {
 TEST_F(IIPMILanTest, AFailureToOpenIsLoggedWithTheCodeAndRemembersTheParameters) {
   for (int code : {1, -1, 255, 2147483647}) {
     SCOPED_TRACE(code);
-    fStandIn.openResult = code;
+    fStandIn.fOpenResult = code;
     std::string const number = std::to_string(code);
     EXPECT_THAT(LogOf([&] { EXPECT_FALSE(fLink->IpmilanOpenConnect("h" + number, "u", "p")); }),
                 ElementsAre("[Debug] Enter IpmilanOpenConnect", "[Debug] host: h" + number, "[Debug] username: u",
@@ -219,7 +219,7 @@ TEST_F(IIPMILanTest, InBandBringsTheUsbLanUpFirst) {
 }
 
 TEST_F(IIPMILanTest, InBandLogsAndReturnsItsFailure) {
-  fStandIn.openResult = 4;
+  fStandIn.fOpenResult = 4;
   EXPECT_THAT(LogOf([&] { EXPECT_FALSE(fLink->IpmiInBandLanConnect(1, "libFan")); }),
               ElementsAre("[Debug] Enter IpmilanOpenConnect", "[Debug] host: 169.254.96.118",
                           "[Debug] username: ", "[Debug] password: ", "[Debug] > OpenConnection(3, 169.254.96.118, 623, , )",
@@ -229,7 +229,7 @@ TEST_F(IIPMILanTest, InBandLogsAndReturnsItsFailure) {
 }
 
 TEST_F(IIPMILanTest, AThrownIntegerIsLoggedWithoutTheFirstLetter) {
-  fStandIn.thrownByOpen = -5;
+  fStandIn.fThrownByOpen = -5;
   std::vector<std::string> const log = LogOf([&] { EXPECT_FALSE(fLink->IpmiInBandLanConnect(0, "libFan")); });
   ASSERT_FALSE(log.empty());
   EXPECT_EQ(log.back(), "[Debug] PMILan Local connected Failed in plugin: libFan,Error Msg:-5");

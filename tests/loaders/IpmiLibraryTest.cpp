@@ -13,7 +13,7 @@ namespace {
 TEST(IpmiLibraryTest, TheCodeOfTheLibraryIsReturned) {
   TStandInIpmiClient& standIn = LoadStandInIpmiClient();
   for (int const code : {0, 1, 11, 15, -7}) {
-    standIn.openResult = code;
+    standIn.fOpenResult = code;
     TIpmiResult const result = OpenIpmiConnection("h", "u", "p");
     EXPECT_EQ(result.fLoad.fKind, TLoadOutcome::kComplete);
     EXPECT_EQ(result.fCode, code);

@@ -59,14 +59,14 @@ TEST(TLoadedLibraryTest, WithoutALibraryTheLastNameIsTheReason) {
 
 TEST(TLoadedLibraryTest, AMissingRequiredFunctionIsNamedAndTheLibraryClosed) {
   struct TRow {
-    char const *library, *function;
+    char const *fLibrary, *fFunction;
   };
   for (TRow const& row : {TRow{SMALL_FIRST, "SmallOther"}, TRow{SMALL_EMPTY, "SmallNumber"}}) {
-    gNames = {row.library, SMALL_SECOND};
+    gNames = {row.fLibrary, SMALL_SECOND};
     TWithOther const library;
     EXPECT_EQ(library.Outcome().fKind, TLoadOutcome::kFunctionMissing);
-    EXPECT_THAT(library.Outcome().fReason, HasSubstr(std::string("undefined symbol: ") + row.function));
-    EXPECT_FALSE(IsLoaded(row.library));
+    EXPECT_THAT(library.Outcome().fReason, HasSubstr(std::string("undefined symbol: ") + row.fFunction));
+    EXPECT_FALSE(IsLoaded(row.fLibrary));
   }
 }
 

@@ -25,8 +25,8 @@ namespace NQRVZEP20 {
 TFakeClock::TFakeClock(std::vector<TTime> const& times) {
   for (TTime const& time : times) {
     tm fields{};
-    fields.tm_year = time.year - 1900, fields.tm_mon = time.month - 1, fields.tm_mday = time.day;
-    fields.tm_hour = time.hour, fields.tm_min = time.minute, fields.tm_sec = time.second;
+    fields.tm_year = time.fYear - 1900, fields.tm_mon = time.fMonth - 1, fields.tm_mday = time.fDay;
+    fields.tm_hour = time.fHour, fields.tm_min = time.fMinute, fields.tm_sec = time.fSecond;
     gTimes.push_back(::timegm(&fields));
   }
   gNext = 0;

@@ -13,7 +13,7 @@ class TFakeClock {
 public:
   // A time of the calendar, in UTC.
   struct TTime {
-    int year, month, day, hour, minute, second;
+    int fYear, fMonth, fDay, fHour, fMinute, fSecond;
   };
 
   explicit TFakeClock(std::vector<TTime> const& times);

@@ -26,7 +26,7 @@ bool gIsScsiFake = false;
 NQRVZEP20::TFastSelect* gFastSelect = nullptr;
 
 struct TDiskIds {
-  std::uint32_t idLun, uniqueHostId;
+  std::uint32_t fIdLun, fUniqueHostId;
 };
 
 // 0 or an errno.

@@ -16,9 +16,9 @@ namespace fs = std::filesystem;
 using TLines = std::vector<std::string>;
 
 struct TOutcome {
-  TLines lines;                      // the result, the log entries, the leaks
-  std::map<std::string, int> calls;  // of which function, and how many
-  bool fired;
+  TLines fLines;                      // the result, the log entries, the leaks
+  std::map<std::string, int> fCalls;  // of which function, and how many
+  bool fFired;
 };
 
 // Runs one operation in a private directory, with a fault (FUNCTION:NUMBER:ERRNO) or without one.
@@ -39,34 +39,34 @@ TOutcome Do(std::string const& operation, std::string const& fault = "") {
   TProgramRun const run = RunProgram("cd " + dir.Path() + " && PATH=" + dir.Path("bin") + ":$PATH ZEP_FAULT=" + fault +
                                      " LD_PRELOAD=" ZEP_FAULTS " timeout 30 " + program + " < /dev/null 2> /dev/null");
   TOutcome outcome{{}, {}, false};
-  if (run.exitCode != 0) outcome.lines.push_back("exit code " + std::to_string(run.exitCode));
+  if (run.exitCode != 0) outcome.fLines.push_back("exit code " + std::to_string(run.exitCode));
   std::istringstream output(run.output);
   std::string line;
   while (std::getline(output, line) && line != "calls") {
     if (line == "fault")
-      outcome.fired = true;
+      outcome.fFired = true;
     else
-      outcome.lines.push_back(line);
+      outcome.fLines.push_back(line);
   }
   std::string function;
-  for (int count; output >> function >> count;) outcome.calls[function] = count;
+  for (int count; output >> function >> count;) outcome.fCalls[function] = count;
   return outcome;
 }
 
 struct TFault {
-  std::string function;  // "child." for a child before its exec
-  std::string number;    // the number of the call, or "all"
-  int error;             // an errno; for write also 0 (nothing is written) and -1 (half is written)
-  TLines lines;
+  std::string fFunction;  // "child." for a child before its exec
+  std::string fNumber;    // the number of the call, or "all"
+  int fError;             // an errno; for write also 0 (nothing is written) and -1 (half is written)
+  TLines fLines;
 };
 
 struct TOperation {
-  std::string name;
-  TLines lines;  // the result without a fault
-  std::vector<TFault> faults;
+  std::string fName;
+  TLines fLines;  // the result without a fault
+  std::vector<TFault> fFaults;
 };
 
-void PrintTo(TOperation const& operation, std::ostream* stream) { *stream << operation.name; }
+void PrintTo(TOperation const& operation, std::ostream* stream) { *stream << operation.fName; }
 
 std::string const kChild = Child("PrintsArguments");
 
@@ -326,35 +326,35 @@ std::vector<TOperation> Operations() {
 class HostFaultsTest : public testing::TestWithParam<TOperation> {};
 
 TEST_P(HostFaultsTest, EveryCallFailsInTurn) {
-  TOutcome const clean = Do(GetParam().name);
-  EXPECT_EQ(clean.lines, GetParam().lines);
-  EXPECT_FALSE(clean.fired);
+  TOutcome const clean = Do(GetParam().fName);
+  EXPECT_EQ(clean.fLines, GetParam().fLines);
+  EXPECT_FALSE(clean.fFired);
 
-  std::map<std::string, int> untried = clean.calls;
-  for (TFault const& fault : GetParam().faults) {
-    untried.erase(fault.function);
-    int const calls = clean.calls.count(fault.function) ? clean.calls.at(fault.function) : 0;
-    EXPECT_TRUE(calls > 0 || kIsSanitized) << fault.function << " is not called";
+  std::map<std::string, int> untried = clean.fCalls;
+  for (TFault const& fault : GetParam().fFaults) {
+    untried.erase(fault.fFunction);
+    int const calls = clean.fCalls.count(fault.fFunction) ? clean.fCalls.at(fault.fFunction) : 0;
+    EXPECT_TRUE(calls > 0 || kIsSanitized) << fault.fFunction << " is not called";
     // Of many calls with the same result, only the first, the second and the last are made to fail.
     for (int number = 1; number <= calls; ++number) {
-      if (fault.number == "all" ? number > 2 && number < calls : fault.number != std::to_string(number)) continue;
-      std::string const name = fault.function + ":" + std::to_string(number) + ":" + std::to_string(fault.error);
+      if (fault.fNumber == "all" ? number > 2 && number < calls : fault.fNumber != std::to_string(number)) continue;
+      std::string const name = fault.fFunction + ":" + std::to_string(number) + ":" + std::to_string(fault.fError);
       SCOPED_TRACE(name);
-      TOutcome const outcome = Do(GetParam().name, name);
-      EXPECT_TRUE(outcome.fired);
-      EXPECT_EQ(outcome.lines, fault.lines);
+      TOutcome const outcome = Do(GetParam().fName, name);
+      EXPECT_TRUE(outcome.fFired);
+      EXPECT_EQ(outcome.fLines, fault.fLines);
     }
   }
   for (auto const& [function, calls] : untried) ADD_FAILURE() << function << " is called " << calls << " times and never failed";
 }
 
 INSTANTIATE_TEST_SUITE_P(Operations, HostFaultsTest, testing::ValuesIn(Operations()),
-                         [](auto const& operation) { return operation.param.name; });
+                         [](auto const& operation) { return operation.param.fName; });
 
 TEST(HostFaultsWithoutMemoryTest, AConfigurationThatCannotBeOpenedForLackOfMemoryIsLogged) {
-  EXPECT_EQ(Do("TConfigWithoutMemory").lines, (TLines{"", "[Debug] TConfig::parseConfigFile(): start to parse config file",
-                                                      "[Error] TConfig::parseConfigFile(): Open config file zep.cfg failed",
-                                                      "[Error] TConfig::getValue(): map is empty"}));
+  EXPECT_EQ(Do("TConfigWithoutMemory").fLines, (TLines{"", "[Debug] TConfig::parseConfigFile(): start to parse config file",
+                                                       "[Error] TConfig::parseConfigFile(): Open config file zep.cfg failed",
+                                                       "[Error] TConfig::getValue(): map is empty"}));
 }
 
 }  // namespace

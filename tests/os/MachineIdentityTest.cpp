@@ -14,10 +14,10 @@ namespace {
 
 TEST(MachineIdentityTest, AProductDescriptionIsCutAtItsFirstDash) {
   struct TRow {
-    char const* description;
-    char const* type;
-    char const* name;
-    char const* model;
+    char const* fDescription;
+    char const* fType;
+    char const* fName;
+    char const* fModel;
   };
   TRow const rows[] = {
       {"Server Q100 -[1234AB7]-", "1234", "Server Q100 ", "AB7"},
@@ -45,13 +45,13 @@ TEST(MachineIdentityTest, AProductDescriptionIsCutAtItsFirstDash) {
       {"Name-[123", "0000", "Name", "Unknown"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.description);
+    SCOPED_TRACE(row.fDescription);
     TMachineIdentity identity;
-    ReadProductDescription(row.description, identity);
-    EXPECT_EQ(identity.type, row.type);
-    EXPECT_EQ(identity.name, row.name);
-    EXPECT_EQ(identity.model, row.model);
-    EXPECT_EQ(identity.serialNumber, "Unknown");
+    ReadProductDescription(row.fDescription, identity);
+    EXPECT_EQ(identity.fType, row.fType);
+    EXPECT_EQ(identity.fName, row.fName);
+    EXPECT_EQ(identity.fModel, row.fModel);
+    EXPECT_EQ(identity.fSerialNumber, "Unknown");
   }
 }
 
@@ -61,7 +61,7 @@ TEST(MachineIdentityTest, EveryLengthOfADescriptionIsReadWithoutAnException) {
     for (std::size_t size = 0; size <= whole.size() - from; ++size) {
       TMachineIdentity identity;
       ReadProductDescription(whole.substr(from, size), identity);
-      EXPECT_EQ(identity.type.size(), 4u) << whole.substr(from, size);
+      EXPECT_EQ(identity.fType.size(), 4u) << whole.substr(from, size);
     }
 }
 
@@ -72,15 +72,15 @@ std::string StringNamedAt(std::string const& structure, std::size_t offset) {
 TEST(MachineIdentityTest, StringsOfAStructureAreFoundByTheirNumber) {
   std::string const structure = Structure(1, "\0\1\2\3\0\4\xFF"s, {"one", "two", "three"});
   struct TRow {
-    std::size_t offset;
-    char const* text;
+    std::size_t fOffset;
+    char const* fText;
   };
   TRow const rows[] = {
       {5, "one"},     {6, "two"},  {7, "three"}, {4, "none"},
       {8, "none"},    {9, "none"}, {10, "none"}, {11, "none"},  // after the formatted area
       {1000, "none"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(StringNamedAt(structure, row.offset), row.text) << row.offset;
+  for (TRow const& row : rows) EXPECT_EQ(StringNamedAt(structure, row.fOffset), row.fText) << row.fOffset;
 }
 
 TEST(MachineIdentityTest, TheLastStringSurvives) {
@@ -90,9 +90,9 @@ TEST(MachineIdentityTest, TheLastStringSurvives) {
 
 TEST(MachineIdentityTest, DamagedStructuresNameNoString) {
   struct TRow {
-    char const* what;
-    std::string structure;
-    char const* text;
+    char const* fWhat;
+    std::string fStructure;
+    char const* fText;
   };
   TRow const rows[] = {
       {"empty", "", "none"},
@@ -111,15 +111,15 @@ TEST(MachineIdentityTest, DamagedStructuresNameNoString) {
       {"a number after the set, followed by another text", "\1\6\0\0\0\3one\0\0two\0\0"s, "none"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
-    EXPECT_EQ(StringNamedAt(row.structure, 5), row.text);
+    SCOPED_TRACE(row.fWhat);
+    EXPECT_EQ(StringNamedAt(row.fStructure, 5), row.fText);
   }
 }
 
 TEST(MachineIdentityTest, ABiosVersionIsCleanedUpToItsBuild) {
   struct TRow {
-    char const* version;
-    char const* cleaned;
+    char const* fVersion;
+    char const* fCleaned;
   };
   TRow const rows[] = {
       {"-[ABE123CUS-1.10]-", "ABE123CUS"},
@@ -133,18 +133,18 @@ TEST(MachineIdentityTest, ABiosVersionIsCleanedUpToItsBuild) {
       {"[]", ""},
       {"", ""},
   };
-  for (TRow const& row : rows) EXPECT_EQ(CleanBiosVersion(row.version), row.cleaned) << row.version;
+  for (TRow const& row : rows) EXPECT_EQ(CleanBiosVersion(row.fVersion), row.fCleaned) << row.fVersion;
 }
 
 TEST(MachineIdentityTest, TheTableHas17DistinctRows) {
   std::set<std::string_view> prefixes, types;
   for (TMachineTypeRow const& row : kMachineTypeTable) {
-    EXPECT_EQ(row.buildPrefix.size(), 2u);
-    for (char c : row.buildPrefix) EXPECT_TRUE(std::islower(static_cast<unsigned char>(c))) << row.buildPrefix;
-    EXPECT_EQ(row.machineType.size(), 4u);
-    for (char c : row.machineType) EXPECT_TRUE(std::isdigit(static_cast<unsigned char>(c))) << row.machineType;
-    prefixes.insert(row.buildPrefix);
-    types.insert(row.machineType);
+    EXPECT_EQ(row.fBuildPrefix.size(), 2u);
+    for (char c : row.fBuildPrefix) EXPECT_TRUE(std::islower(static_cast<unsigned char>(c))) << row.fBuildPrefix;
+    EXPECT_EQ(row.fMachineType.size(), 4u);
+    for (char c : row.fMachineType) EXPECT_TRUE(std::isdigit(static_cast<unsigned char>(c))) << row.fMachineType;
+    prefixes.insert(row.fBuildPrefix);
+    types.insert(row.fMachineType);
   }
   EXPECT_EQ(prefixes.size(), 17u);
   EXPECT_EQ(types.size(), 17u);
@@ -152,10 +152,10 @@ TEST(MachineIdentityTest, TheTableHas17DistinctRows) {
 
 TEST(MachineIdentityTest, TheTypeOfABuildIsThatOfTheFirstRowThatMatches) {
   for (TMachineTypeRow const& row : kMachineTypeTable)
-    EXPECT_EQ(MachineTypeOfBuild(std::string(row.buildPrefix) + "e118b"), std::string(row.machineType)) << row.buildPrefix;
+    EXPECT_EQ(MachineTypeOfBuild(std::string(row.fBuildPrefix) + "e118b"), std::string(row.fMachineType)) << row.fBuildPrefix;
   struct TRow {
-    char const* buildNumber;
-    char const* type;
+    char const* fBuildNumber;
+    char const* fType;
   };
   TRow const rows[] = {
       {"qae118b", "1234"}, {"118bqa", "1234"},                       // anywhere in the string
@@ -163,7 +163,7 @@ TEST(MachineIdentityTest, TheTypeOfABuildIsThatOfTheFirstRowThatMatches) {
       {"qsqv", "5678"},    {"qvqs", "5678"},   {"QAE118B", "none"},  // the build number is given in lower case
       {"q", "none"},       {"q a", "none"},    {"abe123cus", "none"}, {"", "none"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(MachineTypeOfBuild(row.buildNumber).value_or("none"), row.type) << row.buildNumber;
+  for (TRow const& row : rows) EXPECT_EQ(MachineTypeOfBuild(row.fBuildNumber).value_or("none"), row.fType) << row.fBuildNumber;
 }
 
 }  // namespace

@@ -16,8 +16,8 @@ std::string Sample(std::string const& name) { return ReadFile(std::string(ZEP_TE
 
 TEST(MediaTextsTest, FindsTheMarkedDevicesOfRealTexts) {
   struct TRow {
-    char const *text, *header, *marker;
-    TLines files;
+    char const *fText, *fHeader, *fMarker;
+    TLines fFiles;
   };
   TRow const rows[] = {
       {"disk.txt", "Hardware Class: disk", "Virtual", {"/dev/sdc (/dev/sg3)"}},
@@ -30,15 +30,15 @@ TEST(MediaTextsTest, FindsTheMarkedDevicesOfRealTexts) {
       {"floppy.txt", "Hardware Class: floppy", "Floppy Disk", {"/dev/fd0", "/dev/fd0"}},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(std::string(row.text) + " " + row.marker);
-    EXPECT_EQ(DeviceFilesIn(Sample(row.text), row.header, row.marker), row.files);
+    SCOPED_TRACE(std::string(row.fText) + " " + row.fMarker);
+    EXPECT_EQ(DeviceFilesIn(Sample(row.fText), row.fHeader, row.fMarker), row.fFiles);
   }
 }
 
 TEST(MediaTextsTest, HeaderMarkerAndFileAreOnLinesInThatOrder) {
   struct TRow {
-    std::string text;
-    TLines files;
+    std::string fText;
+    TLines fFiles;
   };
   TRow const rows[] = {
       {"", {}},
@@ -65,20 +65,20 @@ TEST(MediaTextsTest, HeaderMarkerAndFileAreOnLinesInThatOrder) {
       {"H\nM\nDevice File:\n", {""}},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.text);
-    EXPECT_EQ(DeviceFilesIn(row.text, "H", "M"), row.files);
+    SCOPED_TRACE(row.fText);
+    EXPECT_EQ(DeviceFilesIn(row.fText, "H", "M"), row.fFiles);
   }
 }
 
 TEST(MediaTextsTest, AnAliasIsCutOffAtTheFirstParenthesis) {
   struct TRow {
-    char const *text, *name;
+    char const *fText, *fName;
   };
   TRow const rows[] = {
       {"/dev/sr0 (/dev/sg1)", "/dev/sr0"}, {"/dev/sr0", "/dev/sr0"}, {"/dev/sr0(/dev/sg1) (x)", "/dev/sr0"},
       {"/dev/sr0   (", "/dev/sr0"},        {"(/dev/sg1)", ""},       {"", ""},
   };
-  for (TRow const& row : rows) EXPECT_EQ(WithoutAlias(row.text), row.name) << row.text;
+  for (TRow const& row : rows) EXPECT_EQ(WithoutAlias(row.fText), row.fName) << row.fText;
 }
 
 // ---- ScsiAddressFrom ----
@@ -92,7 +92,7 @@ std::string TextOf(std::optional<TScsiAddress> const& address) {
 
 TEST(MediaTextsTest, AScsiAddressIsFourNumbers) {
   struct TRow {
-    char const *text, *address;
+    char const *fText, *fAddress;
   };
   TRow const rows[] = {
       {"0:0:0:0", "0 0 0 0"},
@@ -120,7 +120,7 @@ TEST(MediaTextsTest, AScsiAddressIsFourNumbers) {
       {"/dev/sg0", "none"},
       {"[1:2:3:4]", "none"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(TextOf(ScsiAddressFrom(row.text)), row.address) << row.text;
+  for (TRow const& row : rows) EXPECT_EQ(TextOf(ScsiAddressFrom(row.fText)), row.fAddress) << row.fText;
 }
 
 // ---- Lists ----
@@ -128,18 +128,18 @@ TEST(MediaTextsTest, AScsiAddressIsFourNumbers) {
 TEST(MediaTextsTest, TheListOfUsbDevicesIsSearchedByBusAndDevice) {
   std::string const list = Sample("usb-devices.txt");
   struct TRow {
-    int bus, device;
-    bool isThere;
+    int fBus, fDevice;
+    bool fIsThere;
   };
   TRow const rows[] = {{1, 1, true},  {1, 2, true},  {1, 3, true},  {2, 2, true},  {6, 2, true},
                        {2, 3, false}, {0, 1, false}, {7, 1, false}, {3, 21, false}};
-  for (TRow const& row : rows) EXPECT_EQ(Lists(list, {row.bus, row.device}), row.isThere) << row.bus << " " << row.device;
+  for (TRow const& row : rows) EXPECT_EQ(Lists(list, {row.fBus, row.fDevice}), row.fIsThere) << row.fBus << " " << row.fDevice;
 }
 
 TEST(MediaTextsTest, OnlyWholeNumbersOfOneTopologyLineCount) {
   struct TRow {
-    char const* list;
-    bool isThere;
+    char const* fList;
+    bool fIsThere;
   };
   TRow const rows[] = {
       {"T:  Bus=02 Lev=01 Dev#=  3 Spd=480\n", true},
@@ -155,7 +155,7 @@ TEST(MediaTextsTest, OnlyWholeNumbersOfOneTopologyLineCount) {
       {"T:", false},
       {"", false},
   };
-  for (TRow const& row : rows) EXPECT_EQ(Lists(row.list, {2, 3}), row.isThere) << row.list;
+  for (TRow const& row : rows) EXPECT_EQ(Lists(row.fList, {2, 3}), row.fIsThere) << row.fList;
 }
 
 }  // namespace

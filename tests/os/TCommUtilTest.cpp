@@ -16,8 +16,8 @@ using TParts = std::vector<std::string>;
 
 TEST(SplitPathTest, AppendsThePiecesBetweenSeparators) {
   struct TRow {
-    std::string path, separator;
-    TParts without, with;  // keepSeparator false and true
+    std::string fPath, fSeparator;
+    TParts fWithout, fWith;  // keepSeparator false and true
   };
   TRow const rows[] = {
       {"", "/", {}, {}},
@@ -39,12 +39,12 @@ TEST(SplitPathTest, AppendsThePiecesBetweenSeparators) {
       {std::string("a\0b/c", 5), "/", {std::string("a\0b", 3), "c"}, {std::string("a\0b/", 4), "c"}},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.path + " at " + row.separator);
+    SCOPED_TRACE(row.fPath + " at " + row.fSeparator);
     TParts without, with;
-    TCommUtil::SplitPath(row.path, without, row.separator, false);
-    TCommUtil::SplitPath(row.path, with, row.separator, true);
-    EXPECT_EQ(without, row.without);
-    EXPECT_EQ(with, row.with);
+    TCommUtil::SplitPath(row.fPath, without, row.fSeparator, false);
+    TCommUtil::SplitPath(row.fPath, with, row.fSeparator, true);
+    EXPECT_EQ(without, row.fWithout);
+    EXPECT_EQ(with, row.fWith);
   }
 }
 
@@ -128,7 +128,7 @@ TEST_F(MkDirHierTest, DirectoriesMadeBeforeAFailureStay) {
 
 TEST(RemoveSpacesTest, CleansTheFirstLine) {
   struct TRow {
-    std::string text, result;
+    std::string fText, fResult;
   };
   TRow const rows[] = {
       {"", ""},
@@ -161,7 +161,7 @@ TEST(RemoveSpacesTest, CleansTheFirstLine) {
       {"clean\n\xff", "clean"},  // the part that was cut off does not count
       {"clean\r\xff", "clean"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(TCommUtil::RemoveSpaces(row.text), row.result) << testing::PrintToString(row.text);
+  for (TRow const& row : rows) EXPECT_EQ(TCommUtil::RemoveSpaces(row.fText), row.fResult) << testing::PrintToString(row.fText);
 }
 
 TEST(RemoveSpacesTest, EveryOtherByteMakesItEmpty) {

@@ -42,9 +42,9 @@ protected:
 
 TEST_F(TConfigTest, ReadsLinesOfKeyAndValue) {
   struct TRow {
-    char const* name;
-    std::string text;
-    TSettings settings;
+    char const* fName;
+    std::string fText;
+    TSettings fSettings;
   };
   TRow const rows[] = {
       {"one line", "a=1\n", {{"a", "1"}}},
@@ -76,8 +76,8 @@ TEST_F(TConfigTest, ReadsLinesOfKeyAndValue) {
       {"no more than newlines", "\n\n", {}},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.name);
-    EXPECT_EQ(SettingsIn(row.text), row.settings);
+    SCOPED_TRACE(row.fName);
+    EXPECT_EQ(SettingsIn(row.fText), row.fSettings);
   }
 }
 

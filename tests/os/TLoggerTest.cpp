@@ -489,8 +489,8 @@ TEST_F(TLoggerTest, TheSeveritiesHaveTheirNumbers) {
 
 TEST_F(TLoggerTest, EverySeverityHasItsLabel) {
   struct {
-    ILogger::EZEPLogSeverity severity;
-    char const* line;
+    ILogger::EZEPLogSeverity fSeverity;
+    char const* fLine;
   } const rows[] = {
       {ILogger::kLogError, "FDR_[Error] 3/3/2024  9:5:7 Collecting inventory\n"},
       {ILogger::kLogWarning, "FDR_[Warning] 3/3/2024  9:5:7 Collecting inventory\n"},
@@ -499,15 +499,15 @@ TEST_F(TLoggerTest, EverySeverityHasItsLabel) {
       {ILogger::kLogVerbose, "FDR_[Verbose] 3/3/2024  9:5:7 Collecting inventory\n"},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.line);
-    EXPECT_EQ(WrittenAt({2024, 3, 3, 9, 5, 7}, row.severity, "Collecting inventory"), row.line);
+    SCOPED_TRACE(row.fLine);
+    EXPECT_EQ(WrittenAt({2024, 3, 3, 9, 5, 7}, row.fSeverity, "Collecting inventory"), row.fLine);
   }
 }
 
 TEST_F(TLoggerTest, TheTimeHasNoZeroFillAndNoFixedWidth) {
   struct {
-    TFakeClock::TTime time;
-    char const* line;
+    TFakeClock::TTime fTime;
+    char const* fLine;
   } const rows[] = {
       {{2025, 1, 1, 0, 0, 5}, "FDR_[Debug] 1/1/2025  0:0:5 m\n"},
       {{2024, 3, 3, 9, 5, 7}, "FDR_[Debug] 3/3/2024  9:5:7 m\n"},
@@ -515,8 +515,8 @@ TEST_F(TLoggerTest, TheTimeHasNoZeroFillAndNoFixedWidth) {
       {{2024, 10, 9, 10, 9, 10}, "FDR_[Debug] 10/9/2024  10:9:10 m\n"},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.line);
-    EXPECT_EQ(WrittenAt(row.time, ILogger::kLogDebug, "m"), row.line);
+    SCOPED_TRACE(row.fLine);
+    EXPECT_EQ(WrittenAt(row.fTime, ILogger::kLogDebug, "m"), row.fLine);
   }
 }
 
@@ -623,13 +623,14 @@ TEST_F(TLoggerTest, DebugEntryIsWrittenButNotRecordedAtThresholdVerbose) {
 }
 
 struct TOutcome {
-  bool recorded, written, thrown;
+  bool fRecorded, fWritten, fThrown;
   bool operator==(TOutcome const& other) const {
-    return recorded == other.recorded && written == other.written && thrown == other.thrown;
+    return fRecorded == other.fRecorded && fWritten == other.fWritten && fThrown == other.fThrown;
   }
 };
 std::ostream& operator<<(std::ostream& out, TOutcome const& outcome) {
-  return out << (outcome.recorded ? "recorded " : "") << (outcome.written ? "written " : "") << (outcome.thrown ? "thrown" : "");
+  return out << (outcome.fRecorded ? "recorded " : "") << (outcome.fWritten ? "written " : "")
+             << (outcome.fThrown ? "thrown" : "");
 }
 
 // The result of one entry, with a file and without.
@@ -641,17 +642,17 @@ TOutcome OutcomeOf(int severity, std::string const& file) {
   try {
     logger.OutputLogEntry(Severity(severity), "probe");
   } catch (TZEPException const& thrown) {
-    outcome.thrown = thrown.GetStatusCode() == kZEPStatusFail;
+    outcome.fThrown = thrown.GetStatusCode() == kZEPStatusFail;
   }
-  outcome.recorded = !logger.GetLog().empty();
-  outcome.written = !file.empty() && ReadFile(file).size() > kOpenBanner.size();
+  outcome.fRecorded = !logger.GetLog().empty();
+  outcome.fWritten = !file.empty() && ReadFile(file).size() > kOpenBanner.size();
   return outcome;
 }
 
 TEST_F(TLoggerTest, SeverityAndThresholdDecideWhereAnEntryGoes) {
   struct {
-    int severity, threshold;
-    TOutcome withFile, withoutFile;
+    int fSeverity, fThreshold;
+    TOutcome fWithFile, fWithoutFile;
   } const rows[] = {
       // at its own threshold, and one below
       {0, 0, {true, true, false}, {true, false, false}},
@@ -687,10 +688,10 @@ TEST_F(TLoggerTest, SeverityAndThresholdDecideWhereAnEntryGoes) {
       {INT_MIN, INT_MIN, {true, false, true}, {true, false, false}},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(testing::Message() << "severity " << row.severity << ", threshold " << row.threshold);
-    TLogger::SetLogThreshold(Severity(row.threshold));
-    EXPECT_EQ(OutcomeOf(row.severity, Path("a.log")), row.withFile);
-    EXPECT_EQ(OutcomeOf(row.severity, ""), row.withoutFile);
+    SCOPED_TRACE(testing::Message() << "severity " << row.fSeverity << ", threshold " << row.fThreshold);
+    TLogger::SetLogThreshold(Severity(row.fThreshold));
+    EXPECT_EQ(OutcomeOf(row.fSeverity, Path("a.log")), row.fWithFile);
+    EXPECT_EQ(OutcomeOf(row.fSeverity, ""), row.fWithoutFile);
   }
 }
 

@@ -46,8 +46,8 @@ std::pair<TCIMDateTime, std::tm> LocalTimeAndFields() {
 }
 
 struct TZone {
-  char const* text;
-  int standardOffset;  // minutes east of UTC
+  char const* fText;
+  int fStandardOffset;  // minutes east of UTC
 };
 
 TZone const kZones[] = {
@@ -89,8 +89,8 @@ TZone const kZones[] = {
 
 TEST(GetLocalTimeTest, IsTheLocalTimeOfTheZone) {
   for (TZone const& row : kZones) {
-    SCOPED_TRACE(row.text);
-    TEnvironmentGuard const zone("TZ", row.text);
+    SCOPED_TRACE(row.fText);
+    TEnvironmentGuard const zone("TZ", row.fText);
     auto const [time, fields] = LocalTimeAndFields();
     EXPECT_FALSE(time.IsNull());
     EXPECT_FALSE(time.IsInterval());
@@ -100,10 +100,10 @@ TEST(GetLocalTimeTest, IsTheLocalTimeOfTheZone) {
 
 TEST(GetLocalTimeTest, OffsetIsThatOfStandardTimePlusAnHourInDaylightSaving) {
   for (TZone const& row : kZones) {
-    SCOPED_TRACE(row.text);
-    TEnvironmentGuard const zone("TZ", row.text);
+    SCOPED_TRACE(row.fText);
+    TEnvironmentGuard const zone("TZ", row.fText);
     auto const [time, fields] = LocalTimeAndFields();
-    EXPECT_EQ(time.GetUTCOffset(), row.standardOffset + (fields.tm_isdst > 0 ? 60 : 0));
+    EXPECT_EQ(time.GetUTCOffset(), row.fStandardOffset + (fields.tm_isdst > 0 ? 60 : 0));
   }
 }
 
@@ -119,17 +119,17 @@ TEST(GetLocalTimeTest, OffsetInZonesThatNeverOrAlwaysSaveDaylight) {
       {"XST-1XDT0,0/0,J365/49", 120},        // or back, as the Irish winter does
   };
   for (TZone const& row : zones) {
-    SCOPED_TRACE(row.text);
-    TEnvironmentGuard const zone("TZ", row.text);
-    EXPECT_EQ(TOSSpecific::GetLocalTime().GetUTCOffset(), row.standardOffset);
+    SCOPED_TRACE(row.fText);
+    TEnvironmentGuard const zone("TZ", row.fText);
+    EXPECT_EQ(TOSSpecific::GetLocalTime().GetUTCOffset(), row.fStandardOffset);
   }
 }
 
 TEST(GetLocalTimeTest, FollowsTheZoneThroughTheYear) {
   struct TRow {
-    char const* zone;
-    TFakeClock::TTime time;
-    char const* text;
+    char const* fZone;
+    TFakeClock::TTime fTime;
+    char const* fText;
   };
   TRow const rows[] = {
       {"UTC0", {2024, 2, 29, 23, 59, 59}, "20240229235959.000000+000"},
@@ -158,11 +158,11 @@ TEST(GetLocalTimeTest, FollowsTheZoneThroughTheYear) {
       {"IST-1GMT0,M10.5.0,M3.5.0/1", {2024, 7, 15, 12, 0, 0}, "20240715130000.000000+060"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(testing::Message() << row.zone << " in month " << row.time.month << " of " << row.time.year);
-    TFakeClock const clock({row.time});
-    TEnvironmentGuard const zone("TZ", row.zone);
-    EXPECT_EQ(TOSSpecific::GetLocalTime().ToString(), row.text);
-    EXPECT_EQ(TOSSpecific::GetLocalTime().ToString(), row.text);
+    SCOPED_TRACE(testing::Message() << row.fZone << " in month " << row.fTime.fMonth << " of " << row.fTime.fYear);
+    TFakeClock const clock({row.fTime});
+    TEnvironmentGuard const zone("TZ", row.fZone);
+    EXPECT_EQ(TOSSpecific::GetLocalTime().ToString(), row.fText);
+    EXPECT_EQ(TOSSpecific::GetLocalTime().ToString(), row.fText);
   }
 }
 

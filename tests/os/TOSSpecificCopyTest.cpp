@@ -60,17 +60,17 @@ TEST_F(FileCopyTest, DestinationIsNotTruncated) {
 
 TEST_F(FileCopyTest, NewDestinationHasThePermissionsOfTheSourceLessTheUmask) {
   struct TRow {
-    mode_t source, mask, copy;
+    mode_t fSource, fMask, fCopy;
   };
   for (TRow const row :
        {TRow{0644, 0, 0644}, TRow{0755, 022, 0755}, TRow{0777, 022, 0755}, TRow{0666, 077, 0600}, TRow{0400, 0, 0400}}) {
-    SCOPED_TRACE(row.source);
-    std::string const from = fDir.Path("source" + std::to_string(row.source)), to = from + ".copy";
+    SCOPED_TRACE(row.fSource);
+    std::string const from = fDir.Path("source" + std::to_string(row.fSource)), to = from + ".copy";
     WriteFile(from, "text");
-    ::chmod(from.c_str(), row.source);
-    TUmask const mask(row.mask);
+    ::chmod(from.c_str(), row.fSource);
+    TUmask const mask(row.fMask);
     TOSSpecific::FileCopy(from, to);
-    EXPECT_EQ(ModeOf(to), row.copy);
+    EXPECT_EQ(ModeOf(to), row.fCopy);
     EXPECT_EQ(ReadFile(to), "text");
   }
 }

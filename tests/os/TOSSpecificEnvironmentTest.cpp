@@ -95,7 +95,7 @@ TEST(EnvironmentTest, ANameThatWillNotDoIsFalseAndLogged) {
 
 TEST(RelocateRelativePathTest, PutsARelativePathBelowTheBase) {
   struct TRow {
-    std::string base, path, result;
+    std::string fBase, fPath, fResult;
   };
   TRow const rows[] = {
       {"/opt/a", "b/", "/opt/a/b"},
@@ -118,7 +118,7 @@ TEST(RelocateRelativePathTest, PutsARelativePathBelowTheBase) {
       {"", "/", ""},
   };
   for (TRow const& row : rows)
-    EXPECT_EQ(TOSSpecific::RelocateRelativePath(row.base, row.path), row.result) << row.base << " " << row.path;
+    EXPECT_EQ(TOSSpecific::RelocateRelativePath(row.fBase, row.fPath), row.fResult) << row.fBase << " " << row.fPath;
 }
 
 }  // namespace

@@ -53,8 +53,8 @@ TEST_F(TOSSpecificFilesTest, EverythingThatIsNotADirectoryIsAFile) {
   ASSERT_NO_FATAL_FAILURE(MakeSocket(fDir.Path("socket")));
 
   struct TRow {
-    std::string path;
-    bool isFile, isDir;
+    std::string fPath;
+    bool fIsFile, fIsDir;
   };
   TRow const rows[] = {
       {fDir.Path("file"), true, false},
@@ -76,9 +76,9 @@ TEST_F(TOSSpecificFilesTest, EverythingThatIsNotADirectoryIsAFile) {
       {"", false, false},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.path);
-    EXPECT_EQ(TOSSpecific::FileExists(row.path), row.isFile);
-    EXPECT_EQ(TOSSpecific::DirExists(row.path), row.isDir);
+    SCOPED_TRACE(row.fPath);
+    EXPECT_EQ(TOSSpecific::FileExists(row.fPath), row.fIsFile);
+    EXPECT_EQ(TOSSpecific::DirExists(row.fPath), row.fIsDir);
   }
 }
 
@@ -93,16 +93,16 @@ TEST_F(TOSSpecificFilesTest, CreateDirMakesOneDirectory) {
 
 TEST_F(TOSSpecificFilesTest, CreateDirGivesAllPermissionsLessTheUmask) {
   struct TRow {
-    mode_t mask, mode;
+    mode_t fMask, fMode;
   };
   for (TRow const row : {TRow{0, 0777}, TRow{022, 0755}, TRow{027, 0750}, TRow{0777, 0}}) {
-    std::string const path = fDir.Path("mask" + std::to_string(row.mask));
-    mode_t const old = ::umask(row.mask);
+    std::string const path = fDir.Path("mask" + std::to_string(row.fMask));
+    mode_t const old = ::umask(row.fMask);
     TOSSpecific::CreateDir(path);
     ::umask(old);
     struct stat status;
     ASSERT_EQ(::stat(path.c_str(), &status), 0);
-    EXPECT_EQ(status.st_mode & 07777, row.mode) << "umask " << row.mask;
+    EXPECT_EQ(status.st_mode & 07777, row.fMode) << "umask " << row.fMask;
   }
 }
 
@@ -111,8 +111,8 @@ TEST_F(TOSSpecificFilesTest, CreateDirThrowsTheStatusOfItsFailure) {
   fs::create_directory(fDir.Path("dir"));
   fs::create_symlink("nowhere", fDir.Path("dangling"));
   struct TRow {
-    std::string path;
-    EZEPStatusCode status;
+    std::string fPath;
+    EZEPStatusCode fStatus;
   };
   TRow const rows[] = {
       {fDir.Path("dir"), kZEPStatusDirectoryAlreadyExists},
@@ -126,8 +126,8 @@ TEST_F(TOSSpecificFilesTest, CreateDirThrowsTheStatusOfItsFailure) {
       {"", kZEPStatusFileSystemError},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.path);
-    EXPECT_STATUS(TOSSpecific::CreateDir(row.path), row.status);
+    SCOPED_TRACE(row.fPath);
+    EXPECT_STATUS(TOSSpecific::CreateDir(row.fPath), row.fStatus);
   }
   EXPECT_FALSE(fs::exists(fDir.Path("missing")));
 }
@@ -267,8 +267,8 @@ TEST_F(FilesTest, FindFileReturnsTheOutputOfFindLineByLine) {
   fs::permissions(fDir.Path("find"), fs::perms::all);
   TEnvironmentGuard const path("PATH", (fDir.Path() + ":/usr/bin:/bin").c_str());
   struct TRow {
-    std::string output;
-    TNames lines;
+    std::string fOutput;
+    TNames fLines;
   };
   TRow const rows[] = {
       {"", {}},
@@ -279,7 +279,7 @@ TEST_F(FilesTest, FindFileReturnsTheOutputOfFindLineByLine) {
       {"\\n", {""}},
       {"a b\\r\\n", {"a b\r"}},
   };
-  for (TRow const& row : rows) EXPECT_EQ(TOSSpecific::FindFile(row.output), row.lines) << row.output;
+  for (TRow const& row : rows) EXPECT_EQ(TOSSpecific::FindFile(row.fOutput), row.fLines) << row.fOutput;
 }
 
 TEST_F(FilesTest, AnErrorMessageOfFindIsALineAsWell) {

@@ -22,15 +22,15 @@ using testing::IsEmpty;
 namespace {
 
 struct TCall {
-  std::string operation, text;
-  int option, value;  // of openlog: option and facility; of syslog: 0 and priority
+  std::string fOperation, fText;
+  int fOption, fValue;  // of openlog: option and facility; of syslog: 0 and priority
 
   bool operator==(TCall const& other) const {
-    return operation == other.operation && text == other.text && option == other.option && value == other.value;
+    return fOperation == other.fOperation && fText == other.fText && fOption == other.fOption && fValue == other.fValue;
   }
 };
 std::ostream& operator<<(std::ostream& out, TCall const& call) {
-  return out << call.operation << "(" << call.text << ", " << call.option << ", " << call.value << ")";
+  return out << call.fOperation << "(" << call.fText << ", " << call.fOption << ", " << call.fValue << ")";
 }
 
 std::vector<TCall> gCalls;
@@ -76,21 +76,21 @@ ILogger::EZEPLogSeverity Severity(int value) { return static_cast<ILogger::EZEPL
 
 TEST_F(TOSSpecificLogTest, LogSELEventOpensLogsAndClosesWithThePriorityOfTheSeverity) {
   struct {
-    int severity, priority;
+    int fSeverity, fPriority;
   } const rows[] = {{0, LOG_ERR},    {1, LOG_WARNING}, {2, LOG_NOTICE},   {3, LOG_NOTICE},
                     {4, LOG_NOTICE}, {-1, LOG_NOTICE}, {100, LOG_NOTICE}, {7, LOG_NOTICE}};
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.severity);
+    SCOPED_TRACE(row.fSeverity);
     gCalls.clear();
-    TOSSpecific::LogSELEvent("text", Severity(row.severity), 1);
-    EXPECT_THAT(gCalls, ElementsAre(kOpened, TCall{"syslog", "text", 0, row.priority}, kClosed));
+    TOSSpecific::LogSELEvent("text", Severity(row.fSeverity), 1);
+    EXPECT_THAT(gCalls, ElementsAre(kOpened, TCall{"syslog", "text", 0, row.fPriority}, kClosed));
   }
 }
 
 TEST_F(TOSSpecificLogTest, LogSELEventDoesNotReadTheTextAsAFormat) {
   TOSSpecific::LogSELEvent("100%s %n", ILogger::kLogError, 1);
   EXPECT_EQ(gFormat, "%s");
-  EXPECT_EQ(gCalls.at(1).text, "100%s %n");
+  EXPECT_EQ(gCalls.at(1).fText, "100%s %n");
 }
 
 TEST_F(TOSSpecificLogTest, LogSELEventDoesNotUseItsLastArgument) {
@@ -105,8 +105,8 @@ TEST_F(TOSSpecificLogTest, LogSELEventDoesNotUseItsLastArgument) {
 
 TEST_F(TOSSpecificLogTest, SysLogEntryPassesTheCompleteLineWithItsNewline) {
   struct {
-    int severity, priority;
-    char const* line;
+    int fSeverity, fPriority;
+    char const* fLine;
   } const rows[] = {
       {0, LOG_ERR, "FDR_[Error] 3/3/2024  9:5:7 Collecting inventory\n"},
       {1, LOG_WARNING, "FDR_[Warning] 3/3/2024  9:5:7 Collecting inventory\n"},
@@ -116,10 +116,10 @@ TEST_F(TOSSpecificLogTest, SysLogEntryPassesTheCompleteLineWithItsNewline) {
   };
   TFakeClock const clock({{2024, 3, 3, 9, 5, 7}});
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.line);
+    SCOPED_TRACE(row.fLine);
     gCalls.clear();
-    TLogger().SysLogEntry(Severity(row.severity), "Collecting inventory");
-    EXPECT_THAT(gCalls, ElementsAre(kOpened, TCall{"syslog", row.line, 0, row.priority}, kClosed));
+    TLogger().SysLogEntry(Severity(row.fSeverity), "Collecting inventory");
+    EXPECT_THAT(gCalls, ElementsAre(kOpened, TCall{"syslog", row.fLine, 0, row.fPriority}, kClosed));
   }
 }
 
@@ -230,17 +230,17 @@ TEST_F(SetDebugLevelTest, AnEmptyPathLeadsToTheWorkingDirectory) {
 
 TEST_F(SetDebugLevelTest, OnlyTheLevels0To4AreSet) {
   struct TRow {
-    int level;
-    bool result;
+    int fLevel;
+    bool fResult;
   };
   TRow const rows[] = {{0, true},   {1, true},   {2, true},    {3, true},    {4, true},          {5, false},
                        {-1, false}, {99, false}, {100, false}, {101, false}, {2147483647, false}};
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.level);
+    SCOPED_TRACE(row.fLevel);
     TTempDir const dir;
     TLogger::SetLogThreshold(ILogger::kLogMemoryOnly);
-    EXPECT_EQ(SetDebugLevel(row.level, dir.Path("x")), row.result);
-    EXPECT_EQ(Threshold(), row.result ? row.level : static_cast<int>(ILogger::kLogMemoryOnly));
+    EXPECT_EQ(SetDebugLevel(row.fLevel, dir.Path("x")), row.fResult);
+    EXPECT_EQ(Threshold(), row.fResult ? row.fLevel : static_cast<int>(ILogger::kLogMemoryOnly));
     EXPECT_FALSE(std::filesystem::is_empty(dir.Path())) << "the file is made whatever the level is";
   }
 }

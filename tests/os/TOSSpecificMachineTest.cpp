@@ -29,26 +29,26 @@ protected:
 };
 
 struct TIdentityRow {
-  char const* table;
-  char const* type;
-  char const* name;
-  char const* model;
-  char const* serialNumber;
-  char const* biosID;
+  char const* fTable;
+  char const* fType;
+  char const* fName;
+  char const* fModel;
+  char const* fSerialNumber;
+  char const* fBiosId;
 };
 
 void ExpectIdentity(TIdentityRow const& row) {
-  EXPECT_EQ(TOSSpecific::GetMachineType(), row.type);
-  EXPECT_EQ(TOSSpecific::GetMachineTypeFromID(), row.type);
-  EXPECT_EQ(TOSSpecific::GetMachineInfo("type"), row.type);
-  EXPECT_EQ(TOSSpecific::GetMachineName(), row.name);
-  EXPECT_EQ(TOSSpecific::GetMachineInfo("name"), row.name);
-  EXPECT_EQ(TOSSpecific::GetOperatingSystemName(), row.name) << "the machine's name, not the operating system's";
-  EXPECT_EQ(TOSSpecific::GetMachineModel(), row.model);
-  EXPECT_EQ(TOSSpecific::GetMachineInfo("model"), row.model);
-  EXPECT_EQ(TOSSpecific::GetMachineSN(), row.serialNumber);
-  EXPECT_EQ(TOSSpecific::GetMachineInfo("SN"), row.serialNumber);
-  EXPECT_EQ(TOSSpecific::GetBiosID(), row.biosID);
+  EXPECT_EQ(TOSSpecific::GetMachineType(), row.fType);
+  EXPECT_EQ(TOSSpecific::GetMachineTypeFromID(), row.fType);
+  EXPECT_EQ(TOSSpecific::GetMachineInfo("type"), row.fType);
+  EXPECT_EQ(TOSSpecific::GetMachineName(), row.fName);
+  EXPECT_EQ(TOSSpecific::GetMachineInfo("name"), row.fName);
+  EXPECT_EQ(TOSSpecific::GetOperatingSystemName(), row.fName) << "the machine's name, not the operating system's";
+  EXPECT_EQ(TOSSpecific::GetMachineModel(), row.fModel);
+  EXPECT_EQ(TOSSpecific::GetMachineInfo("model"), row.fModel);
+  EXPECT_EQ(TOSSpecific::GetMachineSN(), row.fSerialNumber);
+  EXPECT_EQ(TOSSpecific::GetMachineInfo("SN"), row.fSerialNumber);
+  EXPECT_EQ(TOSSpecific::GetBiosID(), row.fBiosId);
 }
 
 TEST_F(TOSSpecificMachineTest, ReadsRealTables) {
@@ -59,8 +59,8 @@ TEST_F(TOSSpecificMachineTest, ReadsRealTables) {
       {"qemu-own", "0000", "Unknown", "Unknown", "Unknown", "AB"}, {"entry64", "1234", "Server Q100 ", "AB7", "KQ12345", "AB"},
   };
   for (TIdentityRow const& row : rows) {
-    SCOPED_TRACE(row.table);
-    UseTable(RealTable(row.table));
+    SCOPED_TRACE(row.fTable);
+    UseTable(RealTable(row.fTable));
     ExpectIdentity(row);
   }
 }
@@ -147,8 +147,8 @@ TEST_F(TOSSpecificMachineTest, TheBiosVersionMustEndWithinTheFirst100BytesOfItsS
 
 TEST_F(TOSSpecificMachineTest, TheBiosIDIsTheFirstTwoCharactersOrNone) {
   struct TRow {
-    char const* version;
-    char const* biosID;
+    char const* fVersion;
+    char const* fBiosId;
   };
   TRow const rows[] = {
       {"-[ABE123CUS-1.10]-", "AB"},
@@ -161,25 +161,25 @@ TEST_F(TOSSpecificMachineTest, TheBiosIDIsTheFirstTwoCharactersOrNone) {
       {"[]", "00"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.version);
-    UseTable(BiosInformation(row.version));
-    EXPECT_EQ(TOSSpecific::GetBiosID(), row.biosID);
+    SCOPED_TRACE(row.fVersion);
+    UseTable(BiosInformation(row.fVersion));
+    EXPECT_EQ(TOSSpecific::GetBiosID(), row.fBiosId);
   }
 }
 
 TEST_F(TOSSpecificMachineTest, TheMachineTypeIsThatOfTheBiosBuildWhereTheTableKnowsIt) {
   struct TRow {
-    char const* version;
-    char const* type;
+    char const* fVersion;
+    char const* fType;
   };
   TRow const rows[] = {
       {"-[QSE118B-1.30]-", "5678"}, {"-[118BQS-1.30]-", "5678"}, {"-[QXQS-1.30]-", "5678"},
       {"-[ABE118B-1.30]-", "1234"}, {"-[ABE-QS]-", "1234"},  // only the part before the hyphen counts
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.version);
-    UseTable(BiosInformation(row.version) + SystemInformation("Server Q100 -[1234AB7]-", "KQ12345"));
-    EXPECT_EQ(TOSSpecific::GetMachineTypeFromID(), row.type);
+    SCOPED_TRACE(row.fVersion);
+    UseTable(BiosInformation(row.fVersion) + SystemInformation("Server Q100 -[1234AB7]-", "KQ12345"));
+    EXPECT_EQ(TOSSpecific::GetMachineTypeFromID(), row.fType);
     EXPECT_EQ(TOSSpecific::GetMachineType(), "1234");
   }
 }
@@ -306,10 +306,10 @@ std::string BIDString(std::string set, int length, int number) {
 TEST(GetBIDStringTest, CopiesTheStringOfThatNumber) {
   std::string const nothing(16, '#');
   struct TRow {
-    char const* what;
-    std::string set;
-    int length, number;
-    std::string result;
+    char const* fWhat;
+    std::string fSet;
+    int fLength, fNumber;
+    std::string fResult;
   };
   std::string const two = "one\0three\0\0"s;  // and the zero that closes the set
   TRow const rows[] = {
@@ -332,8 +332,8 @@ TEST(GetBIDStringTest, CopiesTheStringOfThatNumber) {
       {"a string after an empty one", "a\0\0b\0\0"s, 6, 3, "1 b\0"s + std::string(14, '#')},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
-    EXPECT_EQ(BIDString(row.set, row.length, row.number), row.result);
+    SCOPED_TRACE(row.fWhat);
+    EXPECT_EQ(BIDString(row.fSet, row.fLength, row.fNumber), row.fResult);
   }
 }
 
@@ -351,8 +351,8 @@ TEST(GetBIDStringTest, ReadsNothingAfterTheLength) {
 // ---- Other libraries of the name libsmbios.so, through a program that the loader's search path leads to them ----
 
 struct TProbeRun {
-  std::string result;
-  std::vector<std::string> log, calls;
+  std::string fResult;
+  std::vector<std::string> fLog, fCalls;
 };
 
 class SmbiosStandInTest : public testing::Test {
@@ -365,10 +365,10 @@ protected:
     std::istringstream output(OutputOfCommand("LD_LIBRARY_PATH=" + libraryDir + ":" + coreDir + " STANDIN_RECORD=" + record +
                                               " " + environment + " " ZEP_IDENTITY_PROBE " " + operation));
     TProbeRun run;
-    std::getline(output, run.result, '\x1E');
-    for (std::string entry; std::getline(output, entry, '\x1E');) run.log.push_back(entry);
+    std::getline(output, run.fResult, '\x1E');
+    for (std::string entry; std::getline(output, entry, '\x1E');) run.fLog.push_back(entry);
     std::istringstream calls(ReadFile(record));
-    for (std::string call; std::getline(calls, call);) run.calls.push_back(call);
+    for (std::string call; std::getline(calls, call);) run.fCalls.push_back(call);
     return run;
   }
 
@@ -387,20 +387,20 @@ std::string const kClosed = "smBiosClose(its handle)";
 
 TEST_F(SmbiosStandInTest, TheLoadersSearchPathIsUsedFirst) {
   TProbeRun const run = Run("SN", StructureFile(SystemInformation("Server Q100 -[1234AB7]-", "KQ12345")));
-  EXPECT_EQ(run.result, "KQ12345");
-  EXPECT_THAT(run.calls, ElementsAre(kLoaded, kGotType1, kClosed));
+  EXPECT_EQ(run.fResult, "KQ12345");
+  EXPECT_THAT(run.fCalls, ElementsAre(kLoaded, kGotType1, kClosed));
 }
 
 TEST_F(SmbiosStandInTest, GetBiosIDReadsType0AndCloses) {
   TProbeRun const run = Run("GetBiosID", StructureFile(BiosInformation("-[ABE123CUS-1.10]-")));
-  EXPECT_EQ(run.result, "AB");
-  EXPECT_THAT(run.calls, ElementsAre(kLoaded, kGotType0, kClosed));
+  EXPECT_EQ(run.fResult, "AB");
+  EXPECT_THAT(run.fCalls, ElementsAre(kLoaded, kGotType0, kClosed));
 }
 
 TEST_F(SmbiosStandInTest, GetMachineTypeFromIDReadsType1ThenType0) {
   TProbeRun const run = Run("GetMachineTypeFromID", StructureFile(BiosInformation("-[QSE118B-1.10]-")));
-  EXPECT_EQ(run.result, "5678");
-  EXPECT_THAT(run.calls, ElementsAre(kLoaded, kGotType1, kClosed, kLoaded, kGotType0, kClosed));
+  EXPECT_EQ(run.fResult, "5678");
+  EXPECT_THAT(run.fCalls, ElementsAre(kLoaded, kGotType1, kClosed, kLoaded, kGotType0, kClosed));
 }
 
 TEST_F(SmbiosStandInTest, AFailedLoadIsLoggedAndNothingElseIsCalled) {
@@ -409,31 +409,31 @@ TEST_F(SmbiosStandInTest, AFailedLoadIsLoggedAndNothingElseIsCalled) {
     std::string const failing = "STANDIN_LOAD_STATUS=" + std::to_string(status);
     std::string const number = std::to_string(status);
     TProbeRun const type = Run("GetMachineType", failing);
-    EXPECT_EQ(type.result, "0000");
-    EXPECT_THAT(type.log, ElementsAre("[Debug] getMachineType() entered.",
-                                      "[Debug] getMachineType: Unable to open SMBIOS lib error = " + number));
-    EXPECT_THAT(type.calls, ElementsAre(kLoaded));
+    EXPECT_EQ(type.fResult, "0000");
+    EXPECT_THAT(type.fLog, ElementsAre("[Debug] getMachineType() entered.",
+                                       "[Debug] getMachineType: Unable to open SMBIOS lib error = " + number));
+    EXPECT_THAT(type.fCalls, ElementsAre(kLoaded));
 
     TProbeRun const bios = Run("GetBiosID", failing);
-    EXPECT_EQ(bios.result, "00");
-    EXPECT_THAT(bios.log, ElementsAre("[Debug] GetBiosID: Unable to open SMBIOS lib error = " + number));
-    EXPECT_THAT(bios.calls, ElementsAre(kLoaded));
+    EXPECT_EQ(bios.fResult, "00");
+    EXPECT_THAT(bios.fLog, ElementsAre("[Debug] GetBiosID: Unable to open SMBIOS lib error = " + number));
+    EXPECT_THAT(bios.fCalls, ElementsAre(kLoaded));
   }
 }
 
 TEST_F(SmbiosStandInTest, ANullHandleIsNotUsed) {
   TProbeRun const type = Run("GetMachineType", "STANDIN_NO_HANDLE=1");
-  EXPECT_EQ(type.result, "0000");
-  EXPECT_THAT(type.log, ElementsAre("[Debug] getMachineType() entered.",
-                                    "[Debug] Unable to read machine type from SMBIOS. Invalid Handle was encountered."));
-  EXPECT_THAT(type.calls, ElementsAre(kLoaded));
+  EXPECT_EQ(type.fResult, "0000");
+  EXPECT_THAT(type.fLog, ElementsAre("[Debug] getMachineType() entered.",
+                                     "[Debug] Unable to read machine type from SMBIOS. Invalid Handle was encountered."));
+  EXPECT_THAT(type.fCalls, ElementsAre(kLoaded));
 
   TProbeRun const bios = Run("GetBiosID", "STANDIN_NO_HANDLE=1");
-  EXPECT_EQ(bios.result, "00");
-  EXPECT_THAT(bios.log, ElementsAre("[Debug] TOSSpecific::GetBiosID - Retrieving first SMBIOS structure",
-                                    "[Debug] TOSSpecific::GetBiosID - smbios read operation failed! ",
-                                    "[Debug] TOSSpecific::GetBiosID - biosID = 00"));
-  EXPECT_THAT(bios.calls, ElementsAre(kLoaded));
+  EXPECT_EQ(bios.fResult, "00");
+  EXPECT_THAT(bios.fLog, ElementsAre("[Debug] TOSSpecific::GetBiosID - Retrieving first SMBIOS structure",
+                                     "[Debug] TOSSpecific::GetBiosID - smbios read operation failed! ",
+                                     "[Debug] TOSSpecific::GetBiosID - biosID = 00"));
+  EXPECT_THAT(bios.fCalls, ElementsAre(kLoaded));
 }
 
 TEST_F(SmbiosStandInTest, AFailedReadOfType1GivesTheDefaultsAndCloses) {
@@ -444,9 +444,9 @@ TEST_F(SmbiosStandInTest, AFailedReadOfType1GivesTheDefaultsAndCloses) {
     for (auto const& [operation, result, entered] : {std::tuple("GetMachineType", "0000", "[Debug] getMachineType() entered."),
                                                      std::tuple("name", "Unknown", "[Debug] getMachineInfo() entered.")}) {
       TProbeRun const run = Run(operation, structure + failure);
-      EXPECT_EQ(run.result, result);
-      EXPECT_THAT(run.log, ElementsAre(entered, "[Debug] Unable to read DMI structure type 1 from SMBIOS"));
-      EXPECT_THAT(run.calls, ElementsAre(kLoaded, kGotType1, kClosed));
+      EXPECT_EQ(run.fResult, result);
+      EXPECT_THAT(run.fLog, ElementsAre(entered, "[Debug] Unable to read DMI structure type 1 from SMBIOS"));
+      EXPECT_THAT(run.fCalls, ElementsAre(kLoaded, kGotType1, kClosed));
     }
   }
 }
@@ -454,15 +454,15 @@ TEST_F(SmbiosStandInTest, AFailedReadOfType1GivesTheDefaultsAndCloses) {
 TEST_F(SmbiosStandInTest, AFailedReadOfType0YieldsNoStringEvenWhenTheBufferHoldsOne) {
   std::string const structure = StructureFile(BiosInformation("-[QSE118B-1.10]-"));
   TProbeRun const bios = Run("GetBiosID", structure + "STANDIN_GET_STATUS=3");
-  EXPECT_EQ(bios.result, "00");
-  EXPECT_THAT(bios.log, ElementsAre("[Debug] TOSSpecific::GetBiosID - Retrieving first SMBIOS structure",
-                                    "[Debug] TOSSpecific::GetBiosID - smbios read operation failed! ",
-                                    "[Debug] TOSSpecific::GetBiosID - biosID = 00"));
-  EXPECT_THAT(bios.calls, ElementsAre(kLoaded, kGotType0, kClosed));
+  EXPECT_EQ(bios.fResult, "00");
+  EXPECT_THAT(bios.fLog, ElementsAre("[Debug] TOSSpecific::GetBiosID - Retrieving first SMBIOS structure",
+                                     "[Debug] TOSSpecific::GetBiosID - smbios read operation failed! ",
+                                     "[Debug] TOSSpecific::GetBiosID - biosID = 00"));
+  EXPECT_THAT(bios.fCalls, ElementsAre(kLoaded, kGotType0, kClosed));
 
   TProbeRun const type = Run("GetMachineTypeFromID", structure + "STANDIN_GET_STATUS=3");
-  EXPECT_EQ(type.result, "0000");
-  EXPECT_THAT(type.log,
+  EXPECT_EQ(type.fResult, "0000");
+  EXPECT_THAT(type.fLog,
               ElementsAre("[Debug] getMachineType() entered.", "[Debug] Unable to read DMI structure type 1 from SMBIOS",
                           "[Debug] TOSSpecific::GetMachineTypeFromID - Retrieving first SMBIOS structure",
                           "[Debug] TOSSpecific::GetMachineTypeFromID - smbios read operation failed! ",
@@ -473,15 +473,15 @@ TEST_F(SmbiosStandInTest, AFailedReadOfType0YieldsNoStringEvenWhenTheBufferHolds
 
 TEST_F(SmbiosStandInTest, NoMoreItemsOfType0StopsAndCloses) {
   TProbeRun const run = Run("GetBiosID", StructureFile(BiosInformation("-[QSE118B-1.10]-")) + "STANDIN_GET_STATUS=5");
-  EXPECT_EQ(run.result, "00");
-  EXPECT_THAT(run.log, ElementsAre("[Debug] TOSSpecific::GetBiosID - Retrieving first SMBIOS structure",
-                                   "[Debug] TOSSpecific::GetBiosID - read all smbios structures available for type 0"));
-  EXPECT_THAT(run.calls, ElementsAre(kLoaded, kGotType0, kClosed));
+  EXPECT_EQ(run.fResult, "00");
+  EXPECT_THAT(run.fLog, ElementsAre("[Debug] TOSSpecific::GetBiosID - Retrieving first SMBIOS structure",
+                                    "[Debug] TOSSpecific::GetBiosID - read all smbios structures available for type 0"));
+  EXPECT_THAT(run.fCalls, ElementsAre(kLoaded, kGotType0, kClosed));
 }
 
 TEST_F(SmbiosStandInTest, AnyOtherStatusOfType0UsesTheBuffer) {
   TProbeRun const run = Run("GetBiosID", StructureFile(BiosInformation("-[QSE118B-1.10]-")) + "STANDIN_GET_STATUS=1");
-  EXPECT_EQ(run.result, "QS");
+  EXPECT_EQ(run.fResult, "QS");
 }
 
 TEST_F(SmbiosStandInTest, ALengthBeyondTheBufferIsNotTrusted) {
@@ -489,15 +489,15 @@ TEST_F(SmbiosStandInTest, ALengthBeyondTheBufferIsNotTrusted) {
   for (char const* length : {"1025", "65536", "2147483647"}) {
     SCOPED_TRACE(length);
     TProbeRun const run = Run("SN", structure + "STANDIN_LENGTH=" + length);
-    EXPECT_EQ(run.result, "KQ12345");
-    EXPECT_THAT(run.calls, ElementsAre(kLoaded, kGotType1, kClosed));
+    EXPECT_EQ(run.fResult, "KQ12345");
+    EXPECT_THAT(run.fCalls, ElementsAre(kLoaded, kGotType1, kClosed));
   }
 }
 
 TEST_F(SmbiosStandInTest, AFormattedAreaThatFillsTheBufferHasNoStrings) {
   TProbeRun const run = Run("GetMachineType", StructureFile("\1\xFF"s + std::string(4, '\1')) + "STANDIN_LENGTH=6");
-  EXPECT_EQ(run.result, "0000");
-  EXPECT_THAT(run.log, Contains("[Debug] getMachineType() completed."));
+  EXPECT_EQ(run.fResult, "0000");
+  EXPECT_THAT(run.fLog, Contains("[Debug] getMachineType() completed."));
 }
 
 TEST_F(SmbiosStandInTest, WithoutMemoryForTheBufferTheDefaultsAreGiven) {
@@ -505,32 +505,32 @@ TEST_F(SmbiosStandInTest, WithoutMemoryForTheBufferTheDefaultsAreGiven) {
   GTEST_SKIP() << "memory cannot be refused under the thread sanitizer";
 #endif
   TProbeRun const type = Run("GetMachineType", "PROBE_NO_MEMORY_FOR=1024");
-  EXPECT_EQ(type.result, "0000");
-  EXPECT_THAT(type.log,
+  EXPECT_EQ(type.fResult, "0000");
+  EXPECT_THAT(type.fLog,
               ElementsAre("[Debug] getMachineType() entered.", "[Debug] Unable to allocate memory to hold machineType"));
-  EXPECT_THAT(type.calls, ElementsAre(kLoaded, kClosed));
+  EXPECT_THAT(type.fCalls, ElementsAre(kLoaded, kClosed));
 
   TProbeRun const bios = Run("GetBiosID", "PROBE_NO_MEMORY_FOR=4096");
-  EXPECT_EQ(bios.result, "00");
-  EXPECT_THAT(bios.log, ElementsAre("[Debug] GetBiosID: Unable to open SMBIOS lib error = 4"));
+  EXPECT_EQ(bios.fResult, "00");
+  EXPECT_THAT(bios.fLog, ElementsAre("[Debug] GetBiosID: Unable to open SMBIOS lib error = 4"));
 }
 
 TEST_F(SmbiosStandInTest, ALibraryWithoutOneOfTheFunctionsIsNotFound) {
   for (char const* variant : {"without-load", "without-get", "without-close"}) {
     SCOPED_TRACE(variant);
     TProbeRun const run = Run("GetMachineType", "", std::string(ZEP_STANDIN_DIR "/") + variant);
-    EXPECT_EQ(run.result, "0000");
-    EXPECT_THAT(run.log,
+    EXPECT_EQ(run.fResult, "0000");
+    EXPECT_THAT(run.fLog,
                 ElementsAre("[Debug] getMachineType() entered.", "[Debug] getMachineType: Unable to open SMBIOS lib error = 15"));
-    EXPECT_TRUE(run.calls.empty());
+    EXPECT_TRUE(run.fCalls.empty());
   }
 }
 
 TEST_F(SmbiosStandInTest, AFileThatIsNotALibraryCannotBeOpened) {
   WriteFile(fDir.Path("libsmbios.so"), "not a library");
   TProbeRun const run = Run("GetBiosID", "", fDir.Path());
-  EXPECT_EQ(run.result, "00");
-  EXPECT_THAT(run.log, ElementsAre("[Debug] GetBiosID: Unable to open SMBIOS lib error = 11"));
+  EXPECT_EQ(run.fResult, "00");
+  EXPECT_THAT(run.fLog, ElementsAre("[Debug] GetBiosID: Unable to open SMBIOS lib error = 11"));
 }
 
 TEST_F(SmbiosStandInTest, WithoutThePlatformLibraryTheDefaultsAreGiven) {
@@ -541,10 +541,10 @@ TEST_F(SmbiosStandInTest, WithoutThePlatformLibraryTheDefaultsAreGiven) {
         std::pair("Type", "error param of GetMachineInfo")}) {
     SCOPED_TRACE(operation);
     TProbeRun const run = Run(operation, "", fDir.Path(), fDir.Path());
-    EXPECT_EQ(run.result, result);
+    EXPECT_EQ(run.fResult, result);
     bool const isBios = std::string("GetBiosID") == operation;
-    EXPECT_THAT(run.log, Contains(isBios ? "[Debug] GetBiosID: Unable to open SMBIOS lib error = 11"
-                                         : "[Debug] getMachineType: Unable to open SMBIOS lib error = 11"));
+    EXPECT_THAT(run.fLog, Contains(isBios ? "[Debug] GetBiosID: Unable to open SMBIOS lib error = 11"
+                                          : "[Debug] getMachineType: Unable to open SMBIOS lib error = 11"));
   }
 }
 

@@ -34,7 +34,7 @@ constexpr int kFails = 1 << 8;  // the result of system() for a command that exi
 
 TEST(MountDeviceTest, FloppyDevicesHaveTheirOwnMountPoint) {
   struct TRow {
-    char const *device, *mountPoint;
+    char const *fDevice, *fMountPoint;
   };
   TRow const rows[] = {
       {"/dev/floppy", "/mnt/floppy"}, {"/dev/fd0", "/mnt/floppy"},
@@ -46,12 +46,13 @@ TEST(MountDeviceTest, FloppyDevicesHaveTheirOwnMountPoint) {
       {"/dev/sr0", "/mnt/key"},       {"", "/mnt/key"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.device);
-    std::string const mountPoint = row.mountPoint;
+    SCOPED_TRACE(row.fDevice);
+    std::string const mountPoint = row.fMountPoint;
     std::string const isMounted = "mount | grep \"" + mountPoint + " type\" >/dev/null";
     TFakeShell const shell({{isMounted, kFails}});
-    EXPECT_EQ(TOSSpecific::MountDevice(row.device), mountPoint);
-    EXPECT_THAT(shell.Commands(), ElementsAre(isMounted, std::string("mount ") + row.device + " " + mountPoint + " 2>/dev/null"));
+    EXPECT_EQ(TOSSpecific::MountDevice(row.fDevice), mountPoint);
+    EXPECT_THAT(shell.Commands(),
+                ElementsAre(isMounted, std::string("mount ") + row.fDevice + " " + mountPoint + " 2>/dev/null"));
   }
 }
 
@@ -145,8 +146,8 @@ TEST_F(StandInTest, MountIsQueriedAndThenMounts) {
 
 TEST_F(StandInTest, AMountedKeyIsFoundInTheListOfMounts) {
   struct TRow {
-    char const *line, *device;
-    bool isMounted;
+    char const *fLine, *fDevice;
+    bool fIsMounted;
   };
   TRow const rows[] = {
       {"/dev/sdb1 on /mnt/key type vfat (rw)", "/dev/sdc", true},
@@ -158,14 +159,14 @@ TEST_F(StandInTest, AMountedKeyIsFoundInTheListOfMounts) {
       {"/dev/sdb1 on /mnt/key", "/dev/sdc", false},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.line);
+    SCOPED_TRACE(row.fLine);
     fs::remove(fDir.Path("calls"));
-    Add("mount", std::string("test $# = 0 && echo '") + row.line + "' || exit 1");
-    if (row.isMounted) {
-      TOSSpecific::MountDevice(row.device);
+    Add("mount", std::string("test $# = 0 && echo '") + row.fLine + "' || exit 1");
+    if (row.fIsMounted) {
+      TOSSpecific::MountDevice(row.fDevice);
       EXPECT_THAT(Calls(), ElementsAre("mount "));
     } else {
-      EXPECT_STATUS(TOSSpecific::MountDevice(row.device), kZEPStatusFileSystemError);
+      EXPECT_STATUS(TOSSpecific::MountDevice(row.fDevice), kZEPStatusFileSystemError);
       EXPECT_THAT(Calls(), testing::SizeIs(3));
     }
   }
@@ -199,8 +200,8 @@ TLines VirtualDevices(int kind, bool keepWhole) {
 TEST_F(StandInTest, VirtualDevicesOfRealTexts) {
   Add("hwinfo", "cat " + PathOfSample("${1#--}.txt"));
   struct TRow {
-    int kind;
-    char const *option, *whole, *cut;
+    int fKind;
+    char const *fOption, *fWhole, *fCut;
   };
   TRow const rows[] = {
       {0, "--disk", "/dev/sdc (/dev/sg3)", "/dev/sdc"},
@@ -209,11 +210,11 @@ TEST_F(StandInTest, VirtualDevicesOfRealTexts) {
       {3, "--mouse", "/dev/input/mice (/dev/input/mouse2)", "/dev/input/mice"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.option);
+    SCOPED_TRACE(row.fOption);
     fs::remove(fDir.Path("calls"));
-    EXPECT_THAT(VirtualDevices(row.kind, true), ElementsAre(row.whole));
-    EXPECT_THAT(VirtualDevices(row.kind, false), ElementsAre(row.cut));
-    std::string const call = std::string("hwinfo ") + row.option;
+    EXPECT_THAT(VirtualDevices(row.fKind, true), ElementsAre(row.fWhole));
+    EXPECT_THAT(VirtualDevices(row.fKind, false), ElementsAre(row.fCut));
+    std::string const call = std::string("hwinfo ") + row.fOption;
     EXPECT_THAT(Calls(), ElementsAre(call, call));
   }
 }
@@ -480,8 +481,8 @@ TEST(EnumerateRemovableMediaTest, TheListOfUsbDevicesIsReadFirstAndInTwoPlaces) 
   constexpr char const* kNewIsMissing = "[Error] ERROR: CaptureFile failed to open: /sys/kernel/debug/usb/devices\n";
   std::string const returned = "[Debug] Debug (linux toss): GetFileContents() Returned: ";
   struct TRow {
-    bool isOld, isNew;
-    std::string log;
+    bool fIsOld, fIsNew;
+    std::string fLog;
   };
   TRow const rows[] = {
       {true, false, returned + "old\n"},
@@ -490,16 +491,16 @@ TEST(EnumerateRemovableMediaTest, TheListOfUsbDevicesIsReadFirstAndInTwoPlaces) 
       {false, false, std::string(kOldIsMissing) + kNewIsMissing},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.log);
+    SCOPED_TRACE(row.fLog);
     EXPECT_EQ(InChild([&] {
                 TFakeMachine machine;
-                if (row.isOld) machine.AddUsbList(TFakeMachine::kOldPlace, "old");
-                if (row.isNew) machine.AddUsbList(TFakeMachine::kNewPlace, "new");
+                if (row.fIsOld) machine.AddUsbList(TFakeMachine::kOldPlace, "old");
+                if (row.fIsNew) machine.AddUsbList(TFakeMachine::kNewPlace, "new");
                 return Joined(LogOf([] {
                   EXPECT_STATUS(TOSSpecific::EnumerateRemovableMedia(boost::make_shared<TFakeNamespace>()), kZEPStatusNotFound);
                 }));
               }),
-              row.log);
+              row.fLog);
   }
 }
 
@@ -528,9 +529,9 @@ TEST(EnumerateRemovableMediaTest, OnlyADiskInTheListIsAUsbDisk) {
   NEEDS_MOUNTS();
   std::string const list = "T:  Bus=02 Lev=01 Dev#=  2\nS:  Product=Key\n";
   struct TRow {
-    std::string usb;   // the USB device above the disk in sysfs; "-" when sysfs does not list the disk
-    std::string list;  // empty: there is none
-    bool isFound;
+    std::string fUsb;   // the USB device above the disk in sysfs; "-" when sysfs does not list the disk
+    std::string fList;  // empty: there is none
+    bool fIsFound;
   };
   TRow const rows[] = {
       {"2/2", list, true},
@@ -546,20 +547,20 @@ TEST(EnumerateRemovableMediaTest, OnlyADiskInTheListIsAUsbDisk) {
       {"-", "", false},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.usb + " " + row.list);
+    SCOPED_TRACE(row.fUsb + " " + row.fList);
     EXPECT_EQ(InChild([&] {
                 TFakeMachine machine;
-                if (row.usb == "-")
+                if (row.fUsb == "-")
                   machine.AddNode("sdb", "1 0 0 0");
                 else
-                  machine.AddDisk("sdb", "1 0 0 0", row.usb);
-                if (!row.list.empty()) machine.AddUsbList(TFakeMachine::kNewPlace, row.list);
+                  machine.AddDisk("sdb", "1 0 0 0", row.fUsb);
+                if (!row.fList.empty()) machine.AddUsbList(TFakeMachine::kNewPlace, row.fList);
                 TScsiNamespace ns;
                 ns.AddDisk("1:0:0:0");
                 TFakeShell const shell({});
                 return Enumerate(ns);
               }),
-              row.isFound ? "/dev/sdb|Maker Stick|/mnt/key\n" : "");
+              row.fIsFound ? "/dev/sdb|Maker Stick|/mnt/key\n" : "");
   }
 }
 
@@ -700,8 +701,8 @@ TEST(EnumerateRemovableMediaTest, AMountDirectoryThatCannotBeMadeStopsNothing) {
 TEST(EnumerateRemovableMediaTest, TheFloppyDriveComesLastUnmountedAndOnce) {
   NEEDS_MOUNTS();
   struct TRow {
-    TLines nodes;
-    std::string media;
+    TLines fNodes;
+    std::string fMedia;
   };
   TRow const rows[] = {
       {{}, ""},
@@ -715,14 +716,14 @@ TEST(EnumerateRemovableMediaTest, TheFloppyDriveComesLastUnmountedAndOnce) {
     EXPECT_EQ(InChild([&] {
                 TFakeMachine machine;
                 machine.AddDisk("sdb", "1 0 0 0", "2/2");
-                for (std::string const& node : row.nodes) machine.AddNode(node, "");
+                for (std::string const& node : row.fNodes) machine.AddNode(node, "");
                 TScsiNamespace ns;
                 ns.AddDisk("1:0:0:0");
                 TFakeShell const shell({});
                 std::string const media = Enumerate(ns);
                 return media + Joined(shell.Commands());
               }),
-              "/dev/sdb|Maker Stick|/mnt/key\n" + row.media + kKeyIsMounted + "\n");
+              "/dev/sdb|Maker Stick|/mnt/key\n" + row.fMedia + kKeyIsMounted + "\n");
 }
 
 TEST(EnumerateRemovableMediaTest, NoDescriptorStaysOpen) {

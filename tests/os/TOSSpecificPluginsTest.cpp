@@ -130,7 +130,7 @@ TEST_F(FindPluginsTest, ASubdirectoryThatCannotBeOpenedIsAFileSystemError) {
 
 TEST(CompanionPathTest, IsBesideThePluginWithoutTheLibraryPrefix) {
   struct {
-    char const *plugin, *kind, *stem;
+    char const *fPlugin, *fKind, *fStem;
   } const rows[] = {
       {"/opt/p/Disk/libDisk.pi.so", "pi", "/opt/p/Disk/Disk"},
       {"libDisk.pi.so", "pi", "Disk"},
@@ -147,13 +147,13 @@ TEST(CompanionPathTest, IsBesideThePluginWithoutTheLibraryPrefix) {
       {"lib.pi.so", "pi", ""},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.plugin);
-    if (row.stem) {
-      EXPECT_EQ(TOSSpecific::BuildSpecificationPath(row.plugin, row.kind), std::string(row.stem) + ".properties.xml");
-      EXPECT_EQ(TOSSpecific::BuildRegistrationPath(row.plugin, row.kind), std::string(row.stem) + ".registration.xml");
+    SCOPED_TRACE(row.fPlugin);
+    if (row.fStem) {
+      EXPECT_EQ(TOSSpecific::BuildSpecificationPath(row.fPlugin, row.fKind), std::string(row.fStem) + ".properties.xml");
+      EXPECT_EQ(TOSSpecific::BuildRegistrationPath(row.fPlugin, row.fKind), std::string(row.fStem) + ".registration.xml");
     } else {
-      EXPECT_THROW(TOSSpecific::BuildSpecificationPath(row.plugin, row.kind), std::out_of_range);
-      EXPECT_THROW(TOSSpecific::BuildRegistrationPath(row.plugin, row.kind), std::out_of_range);
+      EXPECT_THROW(TOSSpecific::BuildSpecificationPath(row.fPlugin, row.fKind), std::out_of_range);
+      EXPECT_THROW(TOSSpecific::BuildRegistrationPath(row.fPlugin, row.fKind), std::out_of_range);
     }
   }
 }
@@ -165,15 +165,15 @@ TEST(CompanionPathTest, TheKindIsCollectionPluginUnlessGiven) {
 
 TEST(CompanionPathTest, WithoutTheEndingOrWithoutTheLibraryPrefixItFails) {
   struct {
-    char const *plugin, *kind;
+    char const *fPlugin, *fKind;
   } const rows[] = {
       {"/opt/p/libDisk.nsp.so", "pi"},  {"/opt/p/libDisk.pi", "pi"}, {"/opt/p/libDiskpi.so", "pi"},  {"", "pi"},
       {"/opt/p/libDisk.cmpi.so", "pi"}, {"/opt/p/Disk.pi.so", "pi"}, {"/opt/p/LIBDisk.pi.so", "pi"}, {"libDisk.pi.so", "cmpi"},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.plugin);
-    EXPECT_STATUS(TOSSpecific::BuildSpecificationPath(row.plugin, row.kind), kZEPStatusFail);
-    EXPECT_STATUS(TOSSpecific::BuildRegistrationPath(row.plugin, row.kind), kZEPStatusFail);
+    SCOPED_TRACE(row.fPlugin);
+    EXPECT_STATUS(TOSSpecific::BuildSpecificationPath(row.fPlugin, row.fKind), kZEPStatusFail);
+    EXPECT_STATUS(TOSSpecific::BuildRegistrationPath(row.fPlugin, row.fKind), kZEPStatusFail);
   }
 }
 
@@ -237,7 +237,7 @@ TEST_F(RootPathTest, HoldsProvidersAndConsumersByTheirBaseNames) {
 
 TEST_F(RootPathTest, CutsThreeAndSevenCharactersOffAnyMatchingName) {
   struct {
-    char const *file, *baseName;
+    char const *fFile, *fBaseName;
   } const rows[] = {
       {"libFan.nsp.so", "Fan"},
       {"libFan.nsp.so.bak", "Fan.nsp"},
@@ -249,10 +249,10 @@ TEST_F(RootPathTest, CutsThreeAndSevenCharactersOffAnyMatchingName) {
       {"a.nspbcdefghij", "spbc"},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.file);
-    WriteFile(fDir.Path(row.file), "");
-    EXPECT_THAT(Probe("nsps"), ElementsAre(row.baseName));
-    fs::remove(fDir.Path(row.file));
+    SCOPED_TRACE(row.fFile);
+    WriteFile(fDir.Path(row.fFile), "");
+    EXPECT_THAT(Probe("nsps"), ElementsAre(row.fBaseName));
+    fs::remove(fDir.Path(row.fFile));
   }
 }
 
@@ -312,17 +312,17 @@ TEST_F(RootPathTest, AProviderThatCannotBeLoadedLogsTheLinkersReason) {
   Install("libUnresolved.nsp.so");
   WriteFile(fDir.Path("libText.nsp.so"), "this is a text, and not a library, however it is called; the linker says so");
   struct {
-    char const *baseName, *reason;
+    char const *fBaseName, *fReason;
   } const rows[] = {
       {"Missing", "libMissing.nsp.so: cannot open shared object file: No such file or directory"},
       {"Text", "libText.nsp.so: invalid ELF header"},
       {"Unresolved", "libUnresolved.nsp.so: undefined symbol: ThereIsNoSuchFunction"},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.baseName);
-    EXPECT_THAT(Probe(std::string("load-nsp ") + row.baseName),
+    SCOPED_TRACE(row.fBaseName);
+    EXPECT_THAT(Probe(std::string("load-nsp ") + row.fBaseName),
                 ElementsAre("threw kZEPStatusFileSystemError",
-                            std::string("logged 0: Couldn't load NSP: ") + row.baseName + " (" + fDir.Path(row.reason) + ")"));
+                            std::string("logged 0: Couldn't load NSP: ") + row.fBaseName + " (" + fDir.Path(row.fReason) + ")"));
   }
 }
 
@@ -388,8 +388,8 @@ TEST(LoadPluginLibraryTest, LinkersReasonTravelsWithTheFailure) {
   };
   std::string const root = TOSSpecific::GetZEPRootPath();
   struct {
-    std::function<void()> load;
-    std::string reason, line;
+    std::function<void()> fLoad;
+    std::string fReason, fLine;
   } const rows[] = {
       {[&] { TOSSpecific::LoadPluginLibrary(dir.Path("libA.pi.so")); }, missing(dir.Path("libA.pi.so")),
        "[Error] ERROR: Failed to load plugin.  Reason: " + missing(dir.Path("libA.pi.so"))},
@@ -399,8 +399,8 @@ TEST(LoadPluginLibraryTest, LinkersReasonTravelsWithTheFailure) {
        "[Error] Couldn't load NSC: Nothing (" + missing(root + "/libNothing.nsc.so") + ")"},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.line);
-    EXPECT_THAT(LogOf([&] { EXPECT_EQ(ReasonOf(row.load), row.reason); }), ElementsAre(row.line));
+    SCOPED_TRACE(row.fLine);
+    EXPECT_THAT(LogOf([&] { EXPECT_EQ(ReasonOf(row.fLoad), row.fReason); }), ElementsAre(row.fLine));
   }
   TLogger().ClearLog();
 }

@@ -24,17 +24,17 @@ using namespace std::chrono_literals;
 constexpr int kForEver = -1;
 
 struct TRun {
-  int result;
-  std::string output;
-  std::chrono::milliseconds time;
+  int fResult;
+  std::string fOutput;
+  std::chrono::milliseconds fTime;
 };
 
 // Runs a program of tests/os/children.
 TRun RunChild(std::string const& name, TArguments const& arguments = {}, int timeout = kForEver) {
   TRun run;
   auto const start = std::chrono::steady_clock::now();
-  run.result = TOSSpecific::SpawnProcess(Child(name), arguments, run.output, timeout);
-  run.time = std::chrono::duration_cast<std::chrono::milliseconds>(std::chrono::steady_clock::now() - start);
+  run.fResult = TOSSpecific::SpawnProcess(Child(name), arguments, run.fOutput, timeout);
+  run.fTime = std::chrono::duration_cast<std::chrono::milliseconds>(std::chrono::steady_clock::now() - start);
   return run;
 }
 
@@ -58,10 +58,10 @@ void EndChild(std::string const& output) {
 
 TEST_F(SpawnProcessTest, ReportsOnlyWhetherTheChildExitedWithZero) {
   struct TRow {
-    std::string child;
-    TArguments arguments;
-    int result;
-    std::string output;
+    std::string fChild;
+    TArguments fArguments;
+    int fResult;
+    std::string fOutput;
   };
   TRow const rows[] = {
       {"PrintsNothing", {}, 0, ""},
@@ -77,10 +77,10 @@ TEST_F(SpawnProcessTest, ReportsOnlyWhetherTheChildExitedWithZero) {
       {"PrintsArguments", {"a", "", "b c", "*", "\"$HOME\""}, 0, "[" + Child("PrintsArguments") + "][a][][b c][*][\"$HOME\"]"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.child);
-    TRun const run = RunChild(row.child, row.arguments);
-    EXPECT_EQ(run.result, row.result);
-    EXPECT_EQ(run.output, row.output);
+    SCOPED_TRACE(row.fChild);
+    TRun const run = RunChild(row.fChild, row.fArguments);
+    EXPECT_EQ(run.fResult, row.fResult);
+    EXPECT_EQ(run.fOutput, row.fOutput);
   }
 }
 
@@ -95,23 +95,23 @@ TEST_F(SpawnProcessTest, AppendsToTheOutput) {
 }
 
 TEST_F(SpawnProcessTest, WaitsForTheLastHolderOfTheOutput) {
-  EXPECT_GE(RunChild("LeavesAGrandchild").time, 450ms);
-  EXPECT_GE(RunChild("RunsOnAfterClosingItsOutput", {"0"}).time, 250ms);
+  EXPECT_GE(RunChild("LeavesAGrandchild").fTime, 450ms);
+  EXPECT_GE(RunChild("RunsOnAfterClosingItsOutput", {"0"}).fTime, 250ms);
 }
 
 TEST_F(SpawnProcessTest, CapturesTwentyMegabytes) {
   constexpr std::size_t kLength = 20 * 1000 * 1000;
   TRun const run = RunChild("PrintsALot", {std::to_string(kLength)});
-  EXPECT_EQ(run.result, 0);
-  ASSERT_EQ(run.output.size(), kLength);
+  EXPECT_EQ(run.fResult, 0);
+  ASSERT_EQ(run.fOutput.size(), kLength);
   for (std::size_t i = 0; i < kLength; ++i)
-    if (run.output[i] != static_cast<char>('a' + i % 26000 % 26)) FAIL() << "wrong at " << i;
+    if (run.fOutput[i] != static_cast<char>('a' + i % 26000 % 26)) FAIL() << "wrong at " << i;
 }
 
 TEST_F(SpawnProcessTest, ZeroByteCutsOffTheRestOfItsChunk) {
-  EXPECT_EQ(RunChild("PrintsZeroByte").output, "before|next");
+  EXPECT_EQ(RunChild("PrintsZeroByte").fOutput, "before|next");
   // 10000 bytes at once, the 101st of them zero: chunks of 4095, 4095 and 1810.
-  EXPECT_EQ(RunChild("PrintsZeroByteAmongMany").output, std::string(100 + 4095 + 1810, 'x'));
+  EXPECT_EQ(RunChild("PrintsZeroByteAmongMany").fOutput, std::string(100 + 4095 + 1810, 'x'));
 }
 
 // Replaces standard input with a pipe that contains only this text, and whose end is not reached before End.
@@ -145,7 +145,7 @@ private:
 TEST_F(SpawnProcessTest, StandardInputIsTheCallers) {
   TTypedInput input("typed");
   input.End();
-  EXPECT_EQ(RunChild("EchoesItsInput").output, "typed");
+  EXPECT_EQ(RunChild("EchoesItsInput").fOutput, "typed");
 }
 
 // ---- The program ----
@@ -166,7 +166,7 @@ TEST_F(SpawnProcessTest, ArgumentZeroAndEnvironmentAreThoseGiven) {
 
 TEST_F(SpawnProcessTest, EnvironmentIsTheCallersWhereNoneIsGiven) {
   TEnvironmentGuard const variable("ZEP_TEST_VARIABLE", "seen by the child");
-  EXPECT_NE(RunChild("PrintsEnvironment").output.find("[ZEP_TEST_VARIABLE=seen by the child]"), std::string::npos);
+  EXPECT_NE(RunChild("PrintsEnvironment").fOutput.find("[ZEP_TEST_VARIABLE=seen by the child]"), std::string::npos);
 }
 
 TEST_F(SpawnProcessTest, OnlyTheFormWithoutEnvironmentSearchesThePath) {
@@ -221,7 +221,7 @@ TEST_F(SpawnProcessTest, ManyAndLongArgumentsArriveComplete) {
     arguments.push_back(std::string(static_cast<std::size_t>(i % 100), 'x'));
     expected += "[" + arguments.back() + "]";
   }
-  EXPECT_EQ(RunChild("PrintsArguments", arguments).output, expected);
+  EXPECT_EQ(RunChild("PrintsArguments", arguments).fOutput, expected);
 }
 
 TEST_F(SpawnProcessTest, StringFormReturnsTheOutputWhateverTheResult) {
@@ -234,7 +234,7 @@ TEST_F(SpawnProcessTest, StringFormReturnsTheOutputWhateverTheResult) {
 TEST_F(SpawnProcessTest, CommandLineIsCutAtEverySingleBlank) {
   std::string const name = Child("PrintsArguments");
   struct TRow {
-    std::string commandLine, output;
+    std::string fCommandLine, fOutput;
   };
   TRow const rows[] = {
       {name, ""},
@@ -248,8 +248,8 @@ TEST_F(SpawnProcessTest, CommandLineIsCutAtEverySingleBlank) {
       {name + " a\tb\nc", "[a\tb\nc]"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.commandLine);
-    EXPECT_EQ(TOSSpecific::SpawnProcess(row.commandLine, kForEver), "[" + name + "]" + row.output);
+    SCOPED_TRACE(row.fCommandLine);
+    EXPECT_EQ(TOSSpecific::SpawnProcess(row.fCommandLine, kForEver), "[" + name + "]" + row.fOutput);
   }
   EXPECT_EQ(TOSSpecific::SpawnProcess(" " + name, kForEver), "");  // an empty program
   EXPECT_EQ(TOSSpecific::SpawnProcess("", kForEver), "");
@@ -274,7 +274,7 @@ TEST_F(SpawnProcessTest, LogsTheCall) {
 
 TEST_F(SpawnProcessTest, AChildEndedByASignalIsLogged) {
   for (char const* signal : {"9", "15", "6"})  // that of 6 may be marked as one that left a core
-    EXPECT_EQ(LogOf([signal] { EXPECT_EQ(RunChild("DiesBySignal", {signal}).result, -1); }),
+    EXPECT_EQ(LogOf([signal] { EXPECT_EQ(RunChild("DiesBySignal", {signal}).fResult, -1); }),
               (TEntries{"[Debug] SpawnProcess: process " + Child("DiesBySignal"),
                         "[Debug] ERROR: SpawnProcess - Child process exited abnormally!"}));
 }
@@ -286,10 +286,10 @@ TEST_F(SpawnProcessTest, TimeoutLimitsSilenceAndLeavesTheChildAlive) {
   EXPECT_EQ(LogOf([&] { run = RunChild("StaysSilent", {}, 3); }),
             (TEntries{"[Debug] SpawnProcess: process " + Child("StaysSilent"),
                       "[Debug] ERROR: SpawnProcess - " + Child("StaysSilent") + " TimeOut!"}));
-  EXPECT_EQ(run.result, -1);
-  EXPECT_GE(run.time, 2990ms);
-  EXPECT_LT(run.time, 15s);
-  EndChild(run.output);  // the output before the silence is kept
+  EXPECT_EQ(run.fResult, -1);
+  EXPECT_GE(run.fTime, 2990ms);
+  EXPECT_LT(run.fTime, 15s);
+  EndChild(run.fOutput);  // the output before the silence is kept
 }
 
 TEST_F(SpawnProcessTest, TimeoutOfTheFormWithEnvironmentNamesItsPath) {
@@ -303,21 +303,21 @@ TEST_F(SpawnProcessTest, TimeoutOfTheFormWithEnvironmentNamesItsPath) {
 
 TEST_F(SpawnProcessTest, TimeoutOfZeroAllowsNoSilenceAtAll) {
   std::string output;
-  EXPECT_EQ(RunChild("TalksSlowly", {"3000", "1"}, 0).result, -1);
+  EXPECT_EQ(RunChild("TalksSlowly", {"3000", "1"}, 0).fResult, -1);
   EXPECT_GT(::wait(nullptr), 0);
 }
 
 TEST_F(SpawnProcessTest, AChildThatKeepsTalkingIsNeverTimedOut) {
   TRun const run = RunChild("TalksSlowly", {"1300", "5"}, 5);
-  EXPECT_EQ(run.result, 0);
-  EXPECT_EQ(run.output, ".....");
-  EXPECT_GE(run.time, 6400ms);
+  EXPECT_EQ(run.fResult, 0);
+  EXPECT_EQ(run.fOutput, ".....");
+  EXPECT_GE(run.fTime, 6400ms);
 }
 
 TEST_F(SpawnProcessTest, TimeoutOfMinusOneWaitsForEver) {
   TRun const run = RunChild("TalksSlowly", {"1500", "1"}, kForEver);
-  EXPECT_EQ(run.result, 0);
-  EXPECT_GE(run.time, 1450ms);
+  EXPECT_EQ(run.fResult, 0);
+  EXPECT_GE(run.fTime, 1450ms);
 }
 
 TEST_F(SpawnProcessTest, AnyOtherNegativeTimeoutIsAFailureOfSelect) {
@@ -325,7 +325,7 @@ TEST_F(SpawnProcessTest, AnyOtherNegativeTimeoutIsAFailureOfSelect) {
   EXPECT_EQ(
       LogOf([&] { run = RunChild("PrintsNothing", {}, -2); }),
       (TEntries{"[Debug] SpawnProcess: process " + Child("PrintsNothing"), "[Debug] ERROR: SpawnProcess - select call failed!"}));
-  EXPECT_EQ(run.result, -1);
+  EXPECT_EQ(run.fResult, -1);
   EXPECT_GT(::wait(nullptr), 0);  // it has not been waited for
 }
 
@@ -366,20 +366,20 @@ TEST_F(SpawnProcessTest, AnInterruptedSelectIsNotRetried) {
         interrupter.join();
       }),
       (TEntries{"[Debug] SpawnProcess: process " + Child("StaysSilent"), "[Debug] ERROR: SpawnProcess - select call failed!"}));
-  EXPECT_EQ(run.result, -1);
-  EndChild(run.output);
+  EXPECT_EQ(run.fResult, -1);
+  EndChild(run.fOutput);
 }
 
 TEST_F(SpawnProcessTest, SignalStateIsThatOfForkAndExec) {
   TSignalAction const caught(Ignored, SIGUSR1), ignored(SIG_IGN, SIGUSR2);
-  EXPECT_EQ(RunChild("PrintsSignals").output, "open,default;open,ignored;");
+  EXPECT_EQ(RunChild("PrintsSignals").fOutput, "open,default;open,ignored;");
 
   sigset_t both, old;
   ::sigemptyset(&both);
   ::sigaddset(&both, SIGUSR1);
   ::sigaddset(&both, SIGUSR2);
   ::pthread_sigmask(SIG_BLOCK, &both, &old);
-  EXPECT_EQ(RunChild("PrintsSignals").output, "blocked,default;blocked,ignored;");
+  EXPECT_EQ(RunChild("PrintsSignals").fOutput, "blocked,default;blocked,ignored;");
   ::pthread_sigmask(SIG_SETMASK, &old, nullptr);
 }
 
@@ -402,7 +402,7 @@ TEST_F(SpawnProcessTest, SignalStateOfTheCallerStaysAsItWas) {
 TEST_F(SpawnProcessTest, AChildThatCannotBeWaitedForIsAFailureOfWaitpid) {
   TSignalAction const action(SIG_IGN, SIGCHLD);  // the kernel takes the child's status itself
   EXPECT_EQ(
-      LogOf([] { EXPECT_EQ(RunChild("ExitsWith3").output, "done\n"); }),
+      LogOf([] { EXPECT_EQ(RunChild("ExitsWith3").fOutput, "done\n"); }),
       (TEntries{"[Debug] SpawnProcess: process " + Child("ExitsWith3"), "[Debug] ERROR: SpawnProcess - waitpid call failed!"}));
 }
 
@@ -429,7 +429,7 @@ TEST_F(SpawnProcessTest, ChildInheritsTheCallersDescriptorsAndNotItsPipe) {
   int const inherited = ::open(dir.Path("inherited").c_str(), O_RDONLY);
   int const closed = ::open(dir.Path("closed").c_str(), O_RDONLY | O_CLOEXEC);
   std::string const expected = InheritableDescriptors();
-  std::string const descriptors = RunChild("PrintsDescriptors").output;
+  std::string const descriptors = RunChild("PrintsDescriptors").fOutput;
   ::close(inherited);
   ::close(closed);
   EXPECT_EQ(descriptors, expected);
@@ -442,7 +442,7 @@ TEST_F(SpawnProcessTest, PipeOfAnotherThreadIsNotInherited) {
   int const count = OpenDescriptors();
   std::thread other([] { RunChild("EchoesItsInput"); });
   while (OpenDescriptors() != count + 1) std::this_thread::sleep_for(5ms);  // the read end of its pipe
-  std::string const during = InheritableDescriptors(), descriptors = RunChild("PrintsDescriptors").output;
+  std::string const during = InheritableDescriptors(), descriptors = RunChild("PrintsDescriptors").fOutput;
   input.End();
   other.join();
   EXPECT_EQ(during, before);
@@ -458,14 +458,14 @@ TEST_F(SpawnProcessTest, NoChildWaitsForThatOfAnotherThread) {
   std::vector<std::thread> waiting;
   std::thread quick([&] {
     while (started < kWaiting || rounds < kWaiting) {
-      if (RunChild("PrintsNothing", {}, kTimeoutSeconds).result != 0) ++wrong;
+      if (RunChild("PrintsNothing", {}, kTimeoutSeconds).fResult != 0) ++wrong;
       ++rounds;
       if (wrong > 0) return;
     }
   });
   for (int i = 0; i < kWaiting; ++i) {
     waiting.emplace_back([&wrong] {
-      if (RunChild("EchoesItsInput").result != 0) ++wrong;
+      if (RunChild("EchoesItsInput").fResult != 0) ++wrong;
     });
     ++started;
     std::this_thread::sleep_for(1ms);
@@ -484,7 +484,7 @@ TEST_F(SpawnProcessTest, OutputIsCapturedEvenWhenTheStandardDescriptorsAreClosed
     EXPECT_EQ(InChild([&] {
                 for (int const fd : closed) ::close(fd);
                 TRun const run = RunChild("PrintsToBoth");
-                return std::to_string(run.result) + " " + run.output;
+                return std::to_string(run.fResult) + " " + run.fOutput;
               }),
               "0 out1 err1 out2 err2");
   }
@@ -513,8 +513,8 @@ TEST_F(SpawnProcessTest, AReadEndThatSelectCannotWatchIsAFailureOfSelectAndNothi
                                "[Debug] ERROR: SpawnProcess - select call failed!"}));
   EXPECT_EQ(output, "");
   EXPECT_FALSE(std::filesystem::exists(dir.Path("run")));
-  EXPECT_EQ(last.result, 0);
-  EXPECT_EQ(last.output, "out1 err1 out2 err2");
+  EXPECT_EQ(last.fResult, 0);
+  EXPECT_EQ(last.fOutput, "out1 err1 out2 err2");
 }
 
 TEST_F(SpawnProcessTest, WithoutDescriptorsForAPipeItIsMinusOneAndLogged) {
@@ -655,13 +655,13 @@ TEST_F(SpawnProcessTest, AStackOf32KiBIsEnough) {
   OnStackOf(32 * 1024, [&] {
     TLogger::GetInstance()->SetLogFilename(dir.Path("log"));
     searched = RunChild("PrintsALot", {std::to_string(kLength)});
-    withEnvironment.result = TOSSpecific::SpawnProcess(Child("PrintsALot"), {std::to_string(kLength)}, "zero", {"A=1"},
-                                                       withEnvironment.output, kForEver);
+    withEnvironment.fResult = TOSSpecific::SpawnProcess(Child("PrintsALot"), {std::to_string(kLength)}, "zero", {"A=1"},
+                                                        withEnvironment.fOutput, kForEver);
   });
-  EXPECT_EQ(searched.result, 0);
-  EXPECT_EQ(searched.output.size(), kLength);
-  EXPECT_EQ(withEnvironment.result, 0);
-  EXPECT_TRUE(withEnvironment.output == searched.output);
+  EXPECT_EQ(searched.fResult, 0);
+  EXPECT_EQ(searched.fOutput.size(), kLength);
+  EXPECT_EQ(withEnvironment.fResult, 0);
+  EXPECT_TRUE(withEnvironment.fOutput == searched.fOutput);
 }
 
 TEST_F(SpawnProcessTest, WorksInManyThreads) {
@@ -673,7 +673,7 @@ TEST_F(SpawnProcessTest, WorksInManyThreads) {
         TRun const run = RunChild("PrintsArguments", {std::to_string(i), std::to_string(round)});
         std::string const expected =
             "[" + Child("PrintsArguments") + "][" + std::to_string(i) + "][" + std::to_string(round) + "]";
-        if (run.result != 0 || run.output != expected) ++wrong;
+        if (run.fResult != 0 || run.fOutput != expected) ++wrong;
       }
     });
   for (std::thread& thread : threads) thread.join();

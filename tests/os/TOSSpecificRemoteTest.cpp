@@ -20,9 +20,9 @@ using testing::ElementsAre;
 using TRemoteOperation = std::string (*)(std::string, std::string, std::string);
 
 struct TOperation {
-  char const* name;
-  TRemoteOperation call;
-  char const* offset;  // low and high byte, as the stand-in writes them
+  char const* fName;
+  TRemoteOperation fCall;
+  char const* fOffset;  // low and high byte, as the stand-in writes them
 };
 
 TOperation const kOperations[] = {
@@ -34,7 +34,7 @@ TOperation const kOperations[] = {
 std::string const kOpened = "[Debug] > OpenConnection(3, bmc.example, 623, zepadmin, secret)";
 
 std::string Sent(TOperation const& operation) {
-  return std::string("[Debug] > SendIpmiCommand(11, 00 ") + operation.offset + " 1e, 4, cleared buffer, 0, ff, 0a)";
+  return std::string("[Debug] > SendIpmiCommand(11, 00 ") + operation.fOffset + " 1e, 4, cleared buffer, 0, ff, 0a)";
 }
 
 // An answer as a controller gives it: the count, then 30 bytes of FRU data.
@@ -46,8 +46,8 @@ class RemoteIdentityTest : public testing::Test {
 protected:
   // Calls the operation with the answer given.
   std::string ResultOf(TRemoteOperation operation, std::string const& answer, int length = -1) {
-    fStandIn.response = answer;
-    fStandIn.responseLength = length;
+    fStandIn.fResponse = answer;
+    fStandIn.fResponseLength = length;
     return operation("bmc.example", "zepadmin", "secret");
   }
 
@@ -62,9 +62,9 @@ TEST_F(RemoteIdentityTest, EachOperationReadsItsPartOfTheFruData) {
 
 TEST_F(RemoteIdentityTest, TheResultIsCutOutOfTheResponse) {
   struct TRow {
-    char const* what;
-    std::string answer;
-    char const *serialNumber, *type, *model;
+    char const* fWhat;
+    std::string fAnswer;
+    char const *fSerialNumber, *fType, *fModel;
   };
   TRow const rows[] = {
       {"longer than each field", Answer("1234567890abcdefghij"), "1234567", "1234", "567890abcdefghij"},
@@ -89,10 +89,10 @@ TEST_F(RemoteIdentityTest, TheResultIsCutOutOfTheResponse) {
       {"a model that begins with its end", Answer("1234"), "1234", "1234", ""},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
-    EXPECT_EQ(UpToZero(ResultOf(TOSSpecific::GetRemoteMSN, row.answer)), row.serialNumber);
-    EXPECT_EQ(UpToZero(ResultOf(TOSSpecific::GetRemoteMT, row.answer)), row.type);
-    EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMachineModel, row.answer), row.model);
+    SCOPED_TRACE(row.fWhat);
+    EXPECT_EQ(UpToZero(ResultOf(TOSSpecific::GetRemoteMSN, row.fAnswer)), row.fSerialNumber);
+    EXPECT_EQ(UpToZero(ResultOf(TOSSpecific::GetRemoteMT, row.fAnswer)), row.fType);
+    EXPECT_EQ(ResultOf(TOSSpecific::GetRemoteMachineModel, row.fAnswer), row.fModel);
   }
 }
 
@@ -125,13 +125,13 @@ TEST_F(RemoteIdentityTest, TheCompleteBufferMayBeFilled) {
 
 TEST_F(RemoteIdentityTest, ASuccessIsLoggedWithTheResponseAsText) {
   for (TOperation const& operation : kOperations) {
-    SCOPED_TRACE(operation.name);
-    EXPECT_THAT(LogOf([&] { ResultOf(operation.call, Answer("1234AB7")); }),
+    SCOPED_TRACE(operation.fName);
+    EXPECT_THAT(LogOf([&] { ResultOf(operation.fCall, Answer("1234AB7")); }),
                 ElementsAre(kOpened, Sent(operation),
-                            "[Debug] SendIpmiCommand successfully. \nrspBuffer for " + std::string(operation.name) + ":",
+                            "[Debug] SendIpmiCommand successfully. \nrspBuffer for " + std::string(operation.fName) + ":",
                             "[Debug] \x1E"
                             "1234AB7"));
-    EXPECT_THAT(LogOf([&] { ResultOf(operation.call, std::string(256, 'f')); }),
+    EXPECT_THAT(LogOf([&] { ResultOf(operation.fCall, std::string(256, 'f')); }),
                 testing::Contains("[Debug] " + std::string(256, 'f')));
   }
 }
@@ -139,34 +139,34 @@ TEST_F(RemoteIdentityTest, ASuccessIsLoggedWithTheResponseAsText) {
 TEST_F(RemoteIdentityTest, WithoutASessionTheResultIsEmptyAndNoCommandIsSent) {
   for (int result : {1, -1, 1000})
     for (TOperation const& operation : kOperations) {
-      SCOPED_TRACE(operation.name);
-      fStandIn.openResult = result;
-      EXPECT_THAT(LogOf([&] { EXPECT_EQ(ResultOf(operation.call, Answer("1234AB7")), ""); }), ElementsAre(kOpened));
+      SCOPED_TRACE(operation.fName);
+      fStandIn.fOpenResult = result;
+      EXPECT_THAT(LogOf([&] { EXPECT_EQ(ResultOf(operation.fCall, Answer("1234AB7")), ""); }), ElementsAre(kOpened));
     }
 }
 
 TEST_F(RemoteIdentityTest, AFailedCommandGivesNotAvailable) {
   for (int result : {1, -1, 1000})
     for (TOperation const& operation : kOperations) {
-      SCOPED_TRACE(operation.name);
-      fStandIn.sendResult = result;
-      EXPECT_THAT(LogOf([&] { EXPECT_EQ(ResultOf(operation.call, Answer("1234AB7")), "N/A"); }),
+      SCOPED_TRACE(operation.fName);
+      fStandIn.fSendResult = result;
+      EXPECT_THAT(LogOf([&] { EXPECT_EQ(ResultOf(operation.fCall, Answer("1234AB7")), "N/A"); }),
                   ElementsAre(kOpened, Sent(operation)));
     }
 }
 
 TEST(RemoteIdentityWithoutAFunctionTest, WithoutOpenConnectionTheResultIsEmpty) {
   LoadStandInIpmiClient("without-open");
-  for (TOperation const& operation : kOperations) EXPECT_EQ(operation.call("h", "u", "p"), "") << operation.name;
+  for (TOperation const& operation : kOperations) EXPECT_EQ(operation.fCall("h", "u", "p"), "") << operation.fName;
 }
 
 TEST(RemoteIdentityWithoutAFunctionTest, WithoutSendIpmiCommandTheResultIsNotAvailable) {
   LoadStandInIpmiClient("without-send");
-  for (TOperation const& operation : kOperations) EXPECT_EQ(operation.call("h", "u", "p"), "N/A") << operation.name;
+  for (TOperation const& operation : kOperations) EXPECT_EQ(operation.fCall("h", "u", "p"), "N/A") << operation.fName;
 }
 
 TEST(RemoteIdentityWithoutAFunctionTest, ClosingIsNotNeeded) {
-  LoadStandInIpmiClient("without-close").response = Answer("1234AB7");
+  LoadStandInIpmiClient("without-close").fResponse = Answer("1234AB7");
   EXPECT_EQ(TOSSpecific::GetRemoteMT("h", "u", "p"), "1234");
 }
 

@@ -18,7 +18,7 @@ using testing::IsEmpty;
 
 TEST(TOSSpecificTextTest, RemoveNonAlpaNumericReturnsTheTextInItsBrackets) {
   struct {
-    char const *text, *expected;
+    char const *fText, *fExpected;
   } const rows[] = {
       {"[ABC123-1.05]", "ABC123-1.05"},
       {"-[ABC123-1.05]-", "ABC123-1.05"},
@@ -36,16 +36,16 @@ TEST(TOSSpecificTextTest, RemoveNonAlpaNumericReturnsTheTextInItsBrackets) {
       {"(ABC) 1.05!", "(ABC) 1.05!"},  // nothing but brackets is removed
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.text);
-    std::string text = row.text;
+    SCOPED_TRACE(row.fText);
+    std::string text = row.fText;
     EXPECT_TRUE(TOSSpecific::removeNonAlpaNumeric(text));
-    EXPECT_EQ(text, row.expected);
+    EXPECT_EQ(text, row.fExpected);
   }
 }
 
 TEST(TOSSpecificTextTest, BreakApartVersionSplitsAtTheSecondHyphenIfThereIsOne) {
   struct {
-    char const *text, *head, *tail;
+    char const *fText, *fHead, *fTail;
   } const rows[] = {
       {"A-B-C", "A-B", "C"},
       {"A-B", "A", "B"},
@@ -62,11 +62,11 @@ TEST(TOSSpecificTextTest, BreakApartVersionSplitsAtTheSecondHyphenIfThereIsOne) 
       {"-A-", "-A", ""},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.text);
-    std::string tail = row.text, head = row.text;
+    SCOPED_TRACE(row.fText);
+    std::string tail = row.fText, head = row.fText;
     EXPECT_TRUE(TOSSpecific::breakApartVersion(tail, head));
-    EXPECT_EQ(head, row.head);
-    EXPECT_EQ(tail, row.tail);
+    EXPECT_EQ(head, row.fHead);
+    EXPECT_EQ(tail, row.fTail);
   }
 }
 
@@ -76,9 +76,9 @@ std::vector<std::string> Split(std::string bytes, unsigned long length, char sep
 
 TEST(TOSSpecificTextTest, MultiStringTokSplitsAtZeroBytes) {
   struct {
-    char const* what;
-    std::string bytes;
-    std::vector<std::string> expected;
+    char const* fWhat;
+    std::string fBytes;
+    std::vector<std::string> fExpected;
   } const rows[] = {
       {"a set with one spare byte", "first\0second\0\0\0"s, {"first", "second"}},
       {"a set without it loses its last string", "first\0second\0\0"s, {"first"}},
@@ -91,8 +91,8 @@ TEST(TOSSpecificTextTest, MultiStringTokSplitsAtZeroBytes) {
       {"every byte value", "\x01\xff\t-\0\0\0"s, {"\x01\xff\t-"}},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.what);
-    EXPECT_THAT(Split(row.bytes, row.bytes.size()), ElementsAreArray(row.expected));
+    SCOPED_TRACE(row.fWhat);
+    EXPECT_THAT(Split(row.fBytes, row.fBytes.size()), ElementsAreArray(row.fExpected));
   }
 }
 
@@ -136,18 +136,18 @@ TEST(TOSSpecificTextTest, MultiStringTokReadsNothingAfterTheBuffer) {
   TGuardedPage const page;
   ASSERT_TRUE(page.IsGuarded());
   struct {
-    std::string bytes;
-    std::vector<std::string> expected;
+    std::string fBytes;
+    std::vector<std::string> fExpected;
   } const rows[] = {
       {"", {}},     {"a", {}},   {"\0"s, {}},     {"ab", {}},    {"a\0"s, {}},
       {"\0a"s, {}}, {"abc", {}}, {"\0ab"s, {""}}, {"a\0b"s, {}}, {"a\0bcdefgh"s, {"a"}},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.bytes);
-    char* const buffer = page.End() - row.bytes.size();
-    std::memcpy(buffer, row.bytes.data(), row.bytes.size());
-    EXPECT_THAT(TOSSpecific::multiStringTok(buffer, row.bytes.size(), '\0'), ElementsAreArray(row.expected));
-    EXPECT_THAT(TOSSpecific::multiStringTok(buffer, row.bytes.size(), '#'), IsEmpty());
+    SCOPED_TRACE(row.fBytes);
+    char* const buffer = page.End() - row.fBytes.size();
+    std::memcpy(buffer, row.fBytes.data(), row.fBytes.size());
+    EXPECT_THAT(TOSSpecific::multiStringTok(buffer, row.fBytes.size(), '\0'), ElementsAreArray(row.fExpected));
+    EXPECT_THAT(TOSSpecific::multiStringTok(buffer, row.fBytes.size(), '#'), IsEmpty());
   }
 }
 

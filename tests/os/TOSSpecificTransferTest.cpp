@@ -47,12 +47,12 @@ void WithStandIn(TCurlRecord& record, std::function<void()> const& work, std::st
   {
     TStandIn const standIn(record, variant);
     work();
-    EXPECT_TRUE(record.calls.empty() || record.calls.back() != "unload");
+    EXPECT_TRUE(record.fCalls.empty() || record.fCalls.back() != "unload");
   }
   EXPECT_EQ(OpenDescriptors(), descriptors);
-  ASSERT_FALSE(record.calls.empty());
-  EXPECT_EQ(record.calls.back(), "unload") << "libcurl is still loaded";
-  record.calls.pop_back();
+  ASSERT_FALSE(record.fCalls.empty());
+  EXPECT_EQ(record.fCalls.back(), "unload") << "libcurl is still loaded";
+  record.fCalls.pop_back();
 }
 
 TLines const kStart = {"global_init 3", "easy_init", "setopt ERRORBUFFER buffer", "setopt FTP_USE_EPSV 0", "setopt PROXY ''"};
@@ -77,17 +77,17 @@ protected:
 };
 
 TEST_F(TransferTest, DownloadSetsItsOptionsInOrder) {
-  fRecord.chunks = {"first ", "second"};
-  fRecord.fileToWatch = fFile;
+  fRecord.fChunks = {"first ", "second"};
+  fRecord.fFileToWatch = fFile;
   TLines log;
   WithStandIn(fRecord, [&] { log = LogOf([&] { TOSSpecific::CurlTransferFile("ftp://h/a b?c", fFile, true); }); });
-  EXPECT_THAT(fRecord.calls,
+  EXPECT_THAT(fRecord.fCalls,
               ElementsAreArray(Joined(kStart,
                                       {"setopt WRITEFUNCTION function", "setopt WRITEDATA context", "setopt URL 'ftp://h/a b?c'",
                                        "setopt FTP_CREATE_MISSING_DIRS 1", "perform", "write 6 file 6", "write 6 file 12"},
                                       kEnd)));
   EXPECT_EQ(ReadFile(fFile), "first second");
-  EXPECT_EQ(fRecord.errorTextAtStart, "");
+  EXPECT_EQ(fRecord.fErrorTextAtStart, "");
   EXPECT_THAT(log, IsEmpty());
 }
 
@@ -96,11 +96,11 @@ TEST_F(TransferTest, UploadSetsItsOptionsInOrder) {
   WriteFile(fFile, text);
   TLines log;
   WithStandIn(fRecord, [&] { log = LogOf([&] { TOSSpecific::CurlTransferFile("sftp://h/f", fFile, false); }); });
-  EXPECT_THAT(fRecord.calls, ElementsAreArray(Joined(kStart,
-                                                     {"setopt UPLOAD 1", "setopt URL 'sftp://h/f'", "setopt READDATA stream",
-                                                      "setopt FTP_CREATE_MISSING_DIRS 1", "perform"},
-                                                     kEnd)));
-  EXPECT_EQ(fRecord.uploaded, text);
+  EXPECT_THAT(fRecord.fCalls, ElementsAreArray(Joined(kStart,
+                                                      {"setopt UPLOAD 1", "setopt URL 'sftp://h/f'", "setopt READDATA stream",
+                                                       "setopt FTP_CREATE_MISSING_DIRS 1", "perform"},
+                                                      kEnd)));
+  EXPECT_EQ(fRecord.fUploaded, text);
   EXPECT_THAT(log, IsEmpty());
 }
 
@@ -112,28 +112,28 @@ TEST_F(TransferTest, AnEmptyDownloadLeavesNoFile) {
 TEST_F(TransferTest, AnEmptyFileIsUploaded) {
   WriteFile(fFile, "");
   WithStandIn(fRecord, [&] { TOSSpecific::CurlTransferFile("ftp://h/f", fFile, false); });
-  EXPECT_THAT(fRecord.calls, testing::Contains("perform"));
-  EXPECT_EQ(fRecord.uploaded, "");
+  EXPECT_THAT(fRecord.fCalls, testing::Contains("perform"));
+  EXPECT_EQ(fRecord.fUploaded, "");
 }
 
 struct TRefusal {
-  int option;
-  char const* message;
-  char const* lastCall;
+  int fOption;
+  char const* fMessage;
+  char const* fLastCall;
 };
 
 // Expects that the operation ends at the refused option: checks the log, the last call, and that everything was released.
 void ExpectRefusals(std::vector<TRefusal> const& rows, std::function<void()> const& operation) {
   for (TRefusal const& row : rows) {
-    SCOPED_TRACE(row.message);
+    SCOPED_TRACE(row.fMessage);
     TCurlRecord record;
-    record.refusedOption = row.option;
+    record.fRefusedOption = row.fOption;
     TLines log;
     WithStandIn(record, [&] { log = LogOf([&] { EXPECT_STATUS(operation(), kZEPStatusLibCurlFailure); }); });
-    EXPECT_THAT(log, ElementsAre(std::string("[Error] ") + row.message));
-    ASSERT_GE(record.calls.size(), 3u);
-    EXPECT_EQ(TLines(record.calls.end() - 2, record.calls.end()), kEnd);
-    EXPECT_EQ(*(record.calls.end() - 3), row.lastCall);
+    EXPECT_THAT(log, ElementsAre(std::string("[Error] ") + row.fMessage));
+    ASSERT_GE(record.fCalls.size(), 3u);
+    EXPECT_EQ(TLines(record.fCalls.end() - 2, record.fCalls.end()), kEnd);
+    EXPECT_EQ(*(record.fCalls.end() - 3), row.fLastCall);
   }
 }
 
@@ -164,13 +164,13 @@ TEST_F(TransferTest, ARefusedOptionEndsAnUpload) {
 }
 
 TEST_F(TransferTest, WithoutAHandleNothingIsSet) {
-  fRecord.givesNoHandle = true;
+  fRecord.fGivesNoHandle = true;
   TLines log;
   WithStandIn(fRecord, [&] {
     log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true), kZEPStatusLibCurlFailure); });
   });
   EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error initalizing curl"));
-  EXPECT_THAT(fRecord.calls, ElementsAre("global_init 3", "easy_init", "global_cleanup"));
+  EXPECT_THAT(fRecord.fCalls, ElementsAre("global_init 3", "easy_init", "global_cleanup"));
 }
 
 TEST_F(TransferTest, AFileThatCannotBeReadEndsAnUploadAfterTheCommonOptions) {
@@ -179,7 +179,7 @@ TEST_F(TransferTest, AFileThatCannotBeReadEndsAnUploadAfterTheCommonOptions) {
     log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", fFile, false), kZEPStatusLibCurlFailure); });
   });
   EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error getting file size"));
-  EXPECT_THAT(fRecord.calls, ElementsAreArray(Joined(kStart, {}, kEnd)));
+  EXPECT_THAT(fRecord.fCalls, ElementsAreArray(Joined(kStart, {}, kEnd)));
 }
 
 TEST_F(TransferTest, AnUploadThatCannotBeReadToItsEndIsAccessDenied) {
@@ -192,13 +192,13 @@ TEST_F(TransferTest, AnUploadThatCannotBeReadToItsEndIsAccessDenied) {
     });
     EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error performing command: "
                                  "the local file cannot be read to its end"));
-    EXPECT_EQ(TLines(record.calls.end() - 3, record.calls.end()), Joined({"perform"}, kEnd, {}));
+    EXPECT_EQ(TLines(record.fCalls.end() - 3, record.fCalls.end()), Joined({"perform"}, kEnd, {}));
   }
 }
 
 TEST_F(TransferTest, AFailedPerformKeepsItsReasonEvenWhenTheFileCannotBeRead) {
-  fRecord.result = 67;
-  fRecord.errorText = "Access denied: 530";
+  fRecord.fResult = 67;
+  fRecord.fErrorText = "Access denied: 530";
   TLines log;
   WithStandIn(fRecord, [&] {
     log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", fDir.Path(), false), kZEPStatusAccessDenied); });
@@ -208,10 +208,10 @@ TEST_F(TransferTest, AFailedPerformKeepsItsReasonEvenWhenTheFileCannotBeRead) {
 
 TEST_F(TransferTest, TheResultOfPerformBecomesAStatus) {
   struct TRow {
-    int result;
-    char const* errorText;
-    EZEPStatusCode status;
-    char const* message;
+    int fResult;
+    char const* fErrorText;
+    EZEPStatusCode fStatus;
+    char const* fMessage;
   };
   TRow const rows[] = {
       {5, "Could not resolve proxy: p", kZEPStatusAccessDenied,
@@ -231,23 +231,23 @@ TEST_F(TransferTest, TheResultOfPerformBecomesAStatus) {
   WriteFile(fDir.Path("there"), "text");
   for (TRow const& row : rows)
     for (bool const download : {true, false}) {
-      SCOPED_TRACE(std::to_string(row.result) + (download ? " down" : " up"));
+      SCOPED_TRACE(std::to_string(row.fResult) + (download ? " down" : " up"));
       TCurlRecord record;
-      record.result = row.result;
-      record.errorText = row.errorText;
+      record.fResult = row.fResult;
+      record.fErrorText = row.fErrorText;
       std::string const file = download ? fFile : fDir.Path("there");
       TLines log;
       WithStandIn(record, [&] {
-        log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file, download), row.status); });
+        log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", file, download), row.fStatus); });
       });
-      EXPECT_THAT(log, ElementsAre(row.message));
-      EXPECT_EQ(TLines(record.calls.end() - 3, record.calls.end()), Joined({"perform"}, kEnd, {}));
+      EXPECT_THAT(log, ElementsAre(row.fMessage));
+      EXPECT_EQ(TLines(record.fCalls.end() - 3, record.fCalls.end()), Joined({"perform"}, kEnd, {}));
     }
 }
 
 TEST_F(TransferTest, APartOfABrokenDownloadStays) {
-  fRecord.chunks = {"part"};
-  fRecord.result = 18;
+  fRecord.fChunks = {"part"};
+  fRecord.fResult = 18;
   WithStandIn(fRecord, [&] { EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true), kZEPStatusAccessDenied); });
   EXPECT_EQ(ReadFile(fFile), "part");
 }
@@ -272,7 +272,7 @@ TEST_F(TransferTest, EachOfTheSixFunctionsIsNeeded) {
     std::string const reason = TStandIn::Path("without_" + name) + ": undefined symbol: " + name;
     EXPECT_THAT(transfer, ElementsAre("[Error] TOSSpecific|CurlTransferFile: Error loading curl library: " + reason));
     EXPECT_THAT(proxyCheck, ElementsAre("[Error] TOSSpecific|CheckProxySetting: Error loading curl library: " + reason));
-    EXPECT_THAT(record.calls, IsEmpty());
+    EXPECT_THAT(record.fCalls, IsEmpty());
   }
 }
 
@@ -305,8 +305,8 @@ protected:
 TEST_F(LoadingCurlTest, TheFirstThatLoadsIsUsedByEachCall) {
   // Each stand-in names its file, once for each call.
   struct TRow {
-    std::function<void()> prepare;
-    std::string used;
+    std::function<void()> fPrepare;
+    std::string fUsed;
   };
   TRow const rows[] = {
       {[] {}, Root("libcurl.so")},
@@ -321,10 +321,10 @@ TEST_F(LoadingCurlTest, TheFirstThatLoadsIsUsedByEachCall) {
       {[this] { Spoil(System("libcurl.so.3")); }, System("libcurl.so.2")},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.used);
-    row.prepare();
+    SCOPED_TRACE(row.fUsed);
+    row.fPrepare();
     TProgramRun const run = Probe();
-    EXPECT_EQ(run.output, row.used + "\ndone\n" + row.used + "\ndone\n");
+    EXPECT_EQ(run.output, row.fUsed + "\ndone\n" + row.fUsed + "\ndone\n");
     EXPECT_EQ(run.exitCode, 0);
   }
 }
@@ -383,11 +383,11 @@ TEST_F(TransferTest, AChunkThatDoesNotGetToTheDiskIsNotWritten) {
 }
 
 TEST_F(TransferTest, ADownloadEndsAtTheFirstChunkThatIsRefused) {
-  fRecord.chunks = {"one", "two"};
+  fRecord.fChunks = {"one", "two"};
   WithStandIn(fRecord, [&] {
     EXPECT_STATUS(TOSSpecific::CurlTransferFile("ftp://h/f", fDir.Path("no/file"), true), kZEPStatusAccessDenied);
   });
-  EXPECT_THAT(fRecord.calls, testing::Contains("write 4294967295").Times(1));
+  EXPECT_THAT(fRecord.fCalls, testing::Contains("write 4294967295").Times(1));
 }
 
 // ---- A local file in the way of a download ----
@@ -398,7 +398,7 @@ std::string DownloadOnto(std::string const& file, std::string const& input, TTem
   WriteFile(dir.Path("input"), input);
   return InChild([&] {
     TCurlRecord record;
-    record.chunks = {"new"};
+    record.fChunks = {"new"};
     if (std::freopen(dir.Path("input").c_str(), "r", stdin) == nullptr) return std::string("no input");
     if (std::freopen(dir.Path("output").c_str(), "w", stdout) == nullptr) return std::string("no output");
     {
@@ -407,7 +407,7 @@ std::string DownloadOnto(std::string const& file, std::string const& input, TTem
     }
     std::fflush(stdout);
     std::string text = ReadFile(dir.Path("output"));
-    for (std::string const& call : record.calls) text += "\n" + call;
+    for (std::string const& call : record.fCalls) text += "\n" + call;
     return text;
   });
 }
@@ -425,25 +425,25 @@ std::string Repeated(std::string const& text, int times) {
 
 TEST_F(TransferTest, ReasonTravelsWithTheFailureWithoutTheOperationsName) {
   struct TRow {
-    int result;
-    std::string text, reason;
+    int fResult;
+    std::string fText, fReason;
   };
   std::string const operation = "TOSSpecific|CurlTransferFile: ";
   for (TRow const& row : {TRow{6, "Could not resolve host: h", "Error connecting to Server"},
                           TRow{67, "Access denied: 530", "Error performing command: Access denied: 530"},
                           TRow{67, "", "Error performing command: "}}) {
-    SCOPED_TRACE(row.reason);
+    SCOPED_TRACE(row.fReason);
     TCurlRecord record;
-    record.result = row.result;
-    record.errorText = row.text;
+    record.fResult = row.fResult;
+    record.fErrorText = row.fText;
     WithStandIn(record,
-                [&] { ExpectReason([&] { TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true); }, operation, row.reason); });
+                [&] { ExpectReason([&] { TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true); }, operation, row.fReason); });
   }
   WithStandIn(fRecord, [&] {
     ExpectReason([&] { TOSSpecific::CurlTransferFile("ftp://h/f", fDir.Path("missing"), false); }, operation,
                  "Error getting file size");
   });
-  fRecord.refusedOption = 10002;  // CURLOPT_URL
+  fRecord.fRefusedOption = 10002;  // CURLOPT_URL
   WithStandIn(fRecord, [&] {
     ExpectReason([&] { TOSSpecific::CurlTransferFile("ftp://h/f", fFile, true); }, operation, "Error setting curl target");
     ExpectReason([&] { TOSSpecific::CheckProxySetting("p", "1", "u:p", 0); },
@@ -453,9 +453,9 @@ TEST_F(TransferTest, ReasonTravelsWithTheFailureWithoutTheOperationsName) {
 
 TEST_F(TransferTest, ALocalFileIsOverwrittenWhenTheAnswerIsY) {
   struct TRow {
-    char const* input;
-    int questions;
-    bool isOverwritten;
+    char const* fInput;
+    int fQuestions;
+    bool fIsOverwritten;
   };
   TRow const rows[] = {
       {"y\n", 1, true},       {"Y\n", 1, true},       {"y", 1, true},  // without an end of line
@@ -465,11 +465,11 @@ TEST_F(TransferTest, ALocalFileIsOverwrittenWhenTheAnswerIsY) {
       {"yes\n", 2, false},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(testing::PrintToString(row.input));
+    SCOPED_TRACE(testing::PrintToString(row.fInput));
     WriteFile(fFile, "old and longer");
-    std::string const output = DownloadOnto(fFile, row.input, fDir);
-    std::string const questions = Repeated(kQuestion, row.questions);
-    if (row.isOverwritten) {
+    std::string const output = DownloadOnto(fFile, row.fInput, fDir);
+    std::string const questions = Repeated(kQuestion, row.fQuestions);
+    if (row.fIsOverwritten) {
       EXPECT_THAT(output, StartsWith(questions + "\nglobal_init 3\n"));
       EXPECT_THAT(output, testing::HasSubstr("\nperform\n"));
       EXPECT_EQ(ReadFile(fFile), "new");
@@ -494,7 +494,7 @@ TEST_F(TransferTest, NoQuestionIsAskedAboutAnUnreadableLocalFile) {
   NEEDS(InChild([] { return BecomeUnprivileged() ? "yes" : "no"; }) == "yes", "a user without privileges");
   std::string const text = InChild([&] {
     TCurlRecord record;
-    record.chunks = {"new"};
+    record.fChunks = {"new"};
     TStandIn const standIn(record);
     if (!BecomeUnprivileged()) return std::string("still privileged");
     if (::freopen("/dev/null", "r", stdin) == nullptr) return std::string("no input");
@@ -511,30 +511,30 @@ TEST_F(TransferTest, UrlsAreMadeOfHostAndName) {
   WriteFile(fFile, "text");
   std::string const upload = "hostline/toqrv/vantor/fdr_upload/";
   struct TRow {
-    char const* isBootable;
-    std::string prefix;
+    char const* fIsBootable;
+    std::string fPrefix;
   };
   TRow const rows[] = {{nullptr, ""}, {"no", ""}, {"", ""}, {"YES", ""}, {"Yes", ""}, {"yes ", ""}, {"yes", upload}};
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.isBootable ? row.isBootable : "not set");
-    TEnvironmentGuard const guard("ZEP_ISBOOTABLE", row.isBootable);
+    SCOPED_TRACE(row.fIsBootable ? row.fIsBootable : "not set");
+    TEnvironmentGuard const guard("ZEP_ISBOOTABLE", row.fIsBootable);
     std::string const absent = fDir.Path("absent");
     struct TOperation {
-      std::function<void()> call;
-      std::string url, uploaded;
+      std::function<void()> fCall;
+      std::string fUrl, fUploaded;
     };
     TOperation const operations[] = {
-        {[&] { TOSSpecific::FTPFile("h:21", fFile, "d/n"); }, "ftp://h:21/" + row.prefix + "d/n", "text"},
-        {[&] { TOSSpecific::sFTPFile("h", fFile, "d/n"); }, "sftp://h/" + row.prefix + "d/n", "text"},
+        {[&] { TOSSpecific::FTPFile("h:21", fFile, "d/n"); }, "ftp://h:21/" + row.fPrefix + "d/n", "text"},
+        {[&] { TOSSpecific::sFTPFile("h", fFile, "d/n"); }, "sftp://h/" + row.fPrefix + "d/n", "text"},
         {[&] { TOSSpecific::UserFTPFile("h", fFile, "n"); }, "ftp://h/n.xml.gz", "text"},
         {[&] { TOSSpecific::FTPFileFromQRV("h", absent, "d/n"); }, "ftp://h/d/n", ""},
         {[&] { TOSSpecific::sFTPFileFromQRV("u:p@h", absent, "n"); }, "sftp://u:p@h/n", ""},
     };
     for (TOperation const& operation : operations) {
       TCurlRecord record;
-      WithStandIn(record, operation.call);
-      EXPECT_THAT(record.calls, testing::Contains("setopt URL '" + operation.url + "'"));
-      EXPECT_EQ(record.uploaded, operation.uploaded) << operation.url;
+      WithStandIn(record, operation.fCall);
+      EXPECT_THAT(record.fCalls, testing::Contains("setopt URL '" + operation.fUrl + "'"));
+      EXPECT_EQ(record.fUploaded, operation.fUploaded) << operation.fUrl;
     }
   }
 }
@@ -553,7 +553,7 @@ TEST_F(TransferTest, ExceptionsOfATransferPassThrough) {
            [&] { TOSSpecific::FTPFileFromQRV("h", fDir.Path("a"), "n"); },
            [&] { TOSSpecific::sFTPFileFromQRV("h", fDir.Path("a"), "n"); }, [&] { TOSSpecific::UserFTPFile("h", fFile, "n"); }}) {
     TCurlRecord record;
-    record.result = 7;
+    record.fResult = 7;
     WithStandIn(record, [&] { EXPECT_STATUS(operation(), kZEPStatusConnectionFailed); });
   }
 }
@@ -566,23 +566,24 @@ protected:
 };
 
 TEST_F(ProxyCheckTest, SetsItsOptionsInOrder) {
-  fRecord.chunks = {"<html>", "</html>"};
-  fRecord.fileToWatch = fDir.Path("content.html");
+  fRecord.fChunks = {"<html>", "</html>"};
+  fRecord.fFileToWatch = fDir.Path("content.html");
   TLines log;
   WithStandIn(fRecord, [&] {
     log = LogOf([&] { EXPECT_EQ(TOSSpecific::CheckProxySetting("10.0.0.1", "8080", "u:p", 5), kZEPStatusOK); });
   });
-  EXPECT_THAT(fRecord.calls, ElementsAre("global_init 3", "easy_init", "setopt ERRORBUFFER buffer", "setopt PROXY '10.0.0.1'",
-                                         "setopt PROXYPORT 8080", "setopt URL '" ZEP_PROXY_CHECK_PAGE "'",
-                                         "setopt WRITEFUNCTION function", "setopt WRITEDATA context", "setopt PROXYUSERPWD 'u:p'",
-                                         "perform", "write 6 file 6", "write 7 file 13", "easy_cleanup", "global_cleanup"));
+  EXPECT_THAT(
+      fRecord.fCalls,
+      ElementsAre("global_init 3", "easy_init", "setopt ERRORBUFFER buffer", "setopt PROXY '10.0.0.1'", "setopt PROXYPORT 8080",
+                  "setopt URL '" ZEP_PROXY_CHECK_PAGE "'", "setopt WRITEFUNCTION function", "setopt WRITEDATA context",
+                  "setopt PROXYUSERPWD 'u:p'", "perform", "write 6 file 6", "write 7 file 13", "easy_cleanup", "global_cleanup"));
   EXPECT_EQ(ReadFile(fDir.Path("content.html")), "<html></html>");
   EXPECT_THAT(log, IsEmpty());
 }
 
 TEST_F(ProxyCheckTest, ThePageIsAppendedToAnExistingFile) {
   WriteFile(fDir.Path("content.html"), "earlier ");
-  fRecord.chunks = {"page"};
+  fRecord.fChunks = {"page"};
   WithStandIn(fRecord, [] { EXPECT_EQ(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), kZEPStatusOK); });
   EXPECT_EQ(ReadFile(fDir.Path("content.html")), "earlier page");
 }
@@ -599,7 +600,7 @@ TEST_F(ProxyCheckTest, ARefusedOptionEndsIt) {
 }
 
 TEST_F(ProxyCheckTest, WithoutAHandleNothingIsSet) {
-  fRecord.givesNoHandle = true;
+  fRecord.fGivesNoHandle = true;
   TLines log;
   WithStandIn(fRecord, [&] {
     log = LogOf([&] { EXPECT_STATUS(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), kZEPStatusLibCurlFailure); });
@@ -609,27 +610,28 @@ TEST_F(ProxyCheckTest, WithoutAHandleNothingIsSet) {
 
 TEST_F(ProxyCheckTest, AFailedPerformIsLoggedAndReturned) {
   struct TRow {
-    int result;
-    EZEPStatusCode status;
+    int fResult;
+    EZEPStatusCode fStatus;
   };
   for (TRow const& row : {TRow{5, kZEPStatusConnectionFailed}, TRow{7, kZEPStatusConnectionFailed},
                           TRow{56, kZEPStatusAccessDenied}, TRow{23, kZEPStatusAccessDenied}}) {
-    SCOPED_TRACE(row.result);
+    SCOPED_TRACE(row.fResult);
     TCurlRecord record;
-    record.result = row.result;
-    record.errorText = "the reason";
+    record.fResult = row.fResult;
+    record.fErrorText = "the reason";
     TLines log;
-    WithStandIn(record, [&] { log = LogOf([&] { EXPECT_EQ(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), row.status); }); });
+    WithStandIn(record,
+                [&] { log = LogOf([&] { EXPECT_EQ(TOSSpecific::CheckProxySetting("p", "1", "u:p", 0), row.fStatus); }); });
     EXPECT_THAT(log, ElementsAre("[Error] TOSSpecific|CheckProxySetting: curl_easy_perform FAILed;the reason"));
-    EXPECT_EQ(TLines(record.calls.end() - 3, record.calls.end()), Joined({"perform"}, kEnd, {}));
+    EXPECT_EQ(TLines(record.fCalls.end() - 3, record.fCalls.end()), Joined({"perform"}, kEnd, {}));
   }
 }
 
 TEST_F(ProxyCheckTest, LibcurlsTextTravelsWithTheStatus) {
   for (std::string const reason : {"Received HTTP code 403 from proxy after CONNECT", ""}) {
     TCurlRecord record;
-    record.result = 56;
-    record.errorText = reason;
+    record.fResult = 56;
+    record.fErrorText = reason;
     TProxyAnswer answer;
     WithStandIn(record, [&] { answer = CheckProxy("p", "1", "u:p"); });
     EXPECT_EQ(answer.fStatus, kZEPStatusAccessDenied);
@@ -639,7 +641,7 @@ TEST_F(ProxyCheckTest, LibcurlsTextTravelsWithTheStatus) {
 
 TEST_F(ProxyCheckTest, APortThatIsNotANumberIsZero) {
   WithStandIn(fRecord, [] { TOSSpecific::CheckProxySetting("p", "many", "", 0); });
-  EXPECT_THAT(fRecord.calls, testing::IsSupersetOf({"setopt PROXYPORT 0", "setopt PROXYUSERPWD ''"}));
+  EXPECT_THAT(fRecord.fCalls, testing::IsSupersetOf({"setopt PROXYPORT 0", "setopt PROXYUSERPWD ''"}));
 }
 
 // ---- The host name ----

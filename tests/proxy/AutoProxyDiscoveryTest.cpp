@@ -120,9 +120,9 @@ TEST(AutoProxyDiscoveryTest, MalformedAddressesAreZeroInTheMessage) {
 
 TEST(AutoProxyDiscoveryTest, ReadsIPV4Addresses) {
   struct {
-    std::string text;
-    std::uint32_t address;
-    bool isValid;
+    std::string fText;
+    std::uint32_t fAddress;
+    bool fIsValid;
   } const rows[] = {
       {"10.77.0.2", Quad(10, 77, 0, 2), true},
       {"0.0.0.0", 0, true},
@@ -144,18 +144,18 @@ TEST(AutoProxyDiscoveryTest, ReadsIPV4Addresses) {
       {std::string("10.77.0.2\0x", 11), 0, false},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.text);
-    TEntries const complaint = {"[Debug] invalid IP Format : " + std::string(row.text.c_str())};
-    EXPECT_EQ(LogOf([&] { EXPECT_EQ(AutoProxyDiscovery::GetIPV4Ciaddr(row.text), row.address); }),
-              row.isValid ? TEntries{} : complaint);
+    SCOPED_TRACE(row.fText);
+    TEntries const complaint = {"[Debug] invalid IP Format : " + std::string(row.fText.c_str())};
+    EXPECT_EQ(LogOf([&] { EXPECT_EQ(AutoProxyDiscovery::GetIPV4Ciaddr(row.fText), row.fAddress); }),
+              row.fIsValid ? TEntries{} : complaint);
   }
 }
 
 TEST(AutoProxyDiscoveryTest, AnIPV6AddressGivesZeroUnlessItIsAMappedIPV4Address) {
   struct {
-    std::string text;
-    std::uint32_t address;
-    bool isValid;
+    std::string fText;
+    std::uint32_t fAddress;
+    bool fIsValid;
   } const rows[] = {
       {"::ffff:10.77.0.2", Quad(10, 77, 0, 2), true},
       {"::ffff:0a4d:0002", Quad(10, 77, 0, 2), true},
@@ -176,17 +176,17 @@ TEST(AutoProxyDiscoveryTest, AnIPV6AddressGivesZeroUnlessItIsAMappedIPV4Address)
       {"::ffff:10.77.0.256", 0, false},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.text);
-    EXPECT_EQ(LogOf([&] { EXPECT_EQ(AutoProxyDiscovery::GetIPV6Ciaddr(row.text), row.address); }),
-              row.isValid ? TEntries{} : TEntries{"[Debug] invalid IP Format : " + row.text});
+    SCOPED_TRACE(row.fText);
+    EXPECT_EQ(LogOf([&] { EXPECT_EQ(AutoProxyDiscovery::GetIPV6Ciaddr(row.fText), row.fAddress); }),
+              row.fIsValid ? TEntries{} : TEntries{"[Debug] invalid IP Format : " + row.fText});
   }
 }
 
 TEST(AutoProxyDiscoveryTest, AnAddressWithAColonIsReadAsIPV6) {
   struct {
-    std::string text;
-    std::uint32_t address;
-    TEntries log;
+    std::string fText;
+    std::uint32_t fAddress;
+    TEntries fLog;
   } const rows[] = {
       {"10.77.0.2", Quad(10, 77, 0, 2), {"[Debug] IP v4 Format!"}},
       {"fe80::1", 0, {"[Debug] IP v6 Format!"}},
@@ -198,16 +198,16 @@ TEST(AutoProxyDiscoveryTest, AnAddressWithAColonIsReadAsIPV6) {
       {"10.77.0.2:80", 0, {"[Debug] IP v6 Format!", "[Debug] invalid IP Format : 10.77.0.2:80"}},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.text);
-    EXPECT_EQ(LogOf([&] { EXPECT_EQ(AutoProxyDiscovery::GetCiaddr(row.text), row.address); }), row.log);
+    SCOPED_TRACE(row.fText);
+    EXPECT_EQ(LogOf([&] { EXPECT_EQ(AutoProxyDiscovery::GetCiaddr(row.fText), row.fAddress); }), row.fLog);
   }
 }
 
 TEST(AutoProxyDiscoveryTest, ReadsHardwareAddresses) {
   std::array<unsigned char, 8> const untouched = {9, 9, 9, 9, 9, 9, 9, 9};
   struct {
-    std::string text;
-    std::array<unsigned char, 8> bytes;  // two more than an address has
+    std::string fText;
+    std::array<unsigned char, 8> fBytes;  // two more than an address has
   } const rows[] = {
       {"00:11:22:33:44:55", {0x00, 0x11, 0x22, 0x33, 0x44, 0x55, 9, 9}},
       {"09:af:AF:f0:0F:ff", {0x09, 0xaf, 0xaf, 0xf0, 0x0f, 0xff, 9, 9}},
@@ -226,11 +226,11 @@ TEST(AutoProxyDiscoveryTest, ReadsHardwareAddresses) {
       {" 0:11:22:33:44:55", untouched},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.text);
+    SCOPED_TRACE(row.fText);
     std::array<unsigned char, 8> bytes = untouched;
-    EXPECT_EQ(LogOf([&] { AutoProxyDiscovery::GetChaddr(row.text, bytes.data()); }),
-              row.bytes == untouched ? TEntries{"[Debug] invalid MAC Format!"} : TEntries{});
-    EXPECT_EQ(bytes, row.bytes);
+    EXPECT_EQ(LogOf([&] { AutoProxyDiscovery::GetChaddr(row.fText, bytes.data()); }),
+              row.fBytes == untouched ? TEntries{"[Debug] invalid MAC Format!"} : TEntries{});
+    EXPECT_EQ(bytes, row.fBytes);
   }
 }
 

@@ -44,9 +44,9 @@ TBytes const kEnd = {255};
 
 TEST_F(DhcpParserTest, FindsTheUrl) {
   struct {
-    char const* what;
-    TBytes options;
-    std::string url;
+    char const* fWhat;
+    TBytes fOptions;
+    std::string fUrl;
   } const rows[] = {
       {"252 first", kUrlOption + kEnd, "url"},
       {"252 first, and no end", kUrlOption, "url"},
@@ -70,8 +70,8 @@ TEST_F(DhcpParserTest, FindsTheUrl) {
       {"an even number of pads", TBytes{0, 0} + kUrlOption, "url"},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.what);
-    EXPECT_EQ(Parse(row.options), row.url);
+    SCOPED_TRACE(row.fWhat);
+    EXPECT_EQ(Parse(row.fOptions), row.fUrl);
   }
 }
 
@@ -83,9 +83,9 @@ TEST_F(DhcpParserTest, APadIsReadWithALength) {
 
 TEST_F(DhcpParserTest, ReadsToTheLastByteOfTheAreaAndNoFurther) {
   struct {
-    char const* what;
-    TBytes options;
-    std::string url;
+    char const* fWhat;
+    TBytes fOptions;
+    std::string fUrl;
   } const rows[] = {
       {"the value ends with the area", FilledTo(kSize - 5) + kUrlOption, "url"},
       {"the value is one byte short", FilledTo(kSize - 4) + kUrlOption, ""},
@@ -98,8 +98,8 @@ TEST_F(DhcpParserTest, ReadsToTheLastByteOfTheAreaAndNoFurther) {
       {"the last option claims more than there is", FilledTo(kSize - 2) + TBytes{1, 255}, ""},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.what);
-    EXPECT_EQ(Parse(row.options), row.url);
+    SCOPED_TRACE(row.fWhat);
+    EXPECT_EQ(Parse(row.fOptions), row.fUrl);
   }
 }
 
@@ -121,8 +121,8 @@ TEST_F(DhcpParserTest, AnyByteMayFillTheArea) {
 
 TEST_F(DhcpParserTest, ReadsTheRepliesOfRealServers) {
   struct {
-    char const* file;
-    std::string url;
+    char const* fFile;
+    std::string fUrl;
   } const rows[] = {
       {"reply-isc.hex", "http://wpad.test/wpad.dat"},
       {"reply-isc-full.hex", "http://wpad.test/wpad.dat"},
@@ -132,10 +132,10 @@ TEST_F(DhcpParserTest, ReadsTheRepliesOfRealServers) {
       {"reply-kea.hex", "http://wpad.test/wpad.dat"},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.file);
-    TBytes const reply = RecordedReply(row.file);
+    SCOPED_TRACE(row.fFile);
+    TBytes const reply = RecordedReply(row.fFile);
     ASSERT_GT(reply.size(), 240u);
-    EXPECT_EQ(Parse(TBytes(reply.begin() + 240, reply.end())), row.url);
+    EXPECT_EQ(Parse(TBytes(reply.begin() + 240, reply.end())), row.fUrl);
   }
 }
 

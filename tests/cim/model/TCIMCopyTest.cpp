@@ -379,8 +379,8 @@ TEST_F(TCIMCopyTest, ADeclarationKeepsTypeBoundDefaultAndMarks) {
 
 TEST_F(TCIMCopyTest, ADeclarationThatThrowsIsSkippedWithOneLine) {
   struct TRow {
-    std::string call;
-    std::vector<std::string> declared;  // what the class has afterwards
+    std::string fCall;
+    std::vector<std::string> fDeclared;  // what the class has afterwards
   };
   for (TRow const& row :
        {TRow{"GetPropertyDecl dst:X_B.Bad", {"First", "Last"}}, TRow{"GetQualifier src:X_B.Bad OVERRIDE", {"First", "Last"}},
@@ -388,9 +388,9 @@ TEST_F(TCIMCopyTest, ADeclarationThatThrowsIsSkippedWithOneLine) {
         TRow{"AddPropertyDecl dst:X_B.Bad", {"First", "Last"}}, TRow{"EnumerateQualifiers src:X_B.Bad", {"First", "Bad", "Last"}},
         TRow{"GetQualifierDecl dst:Weak", {"First", "Bad", "Last"}},
         TRow{"AddQualifier dst:X_B.Bad Weak", {"First", "Bad", "Last"}}}) {
-    SCOPED_TRACE(row.call);
+    SCOPED_TRACE(row.fCall);
     TTrace trace;
-    trace.fOnCall[row.call] = [] { throw TZEPException(kZEPStatusNotFound); };
+    trace.fOnCall[row.fCall] = [] { throw TZEPException(kZEPStatusNotFound); };
     auto const source = NewNamespace();
     source->DefineClass("X_A");
     source->DefineClass("X_B")
@@ -406,7 +406,7 @@ TEST_F(TCIMCopyTest, ADeclarationThatThrowsIsSkippedWithOneLine) {
                             boost::make_shared<TTracedNamespace>(trace, copy, "dst"), false);
       EXPECT_THAT(log.Entries(), ElementsAre(kLine));
     });
-    EXPECT_EQ(Names(*copy->GetClass("X_B", kNone), &ICIMClass::EnumeratePropertyDecls), row.declared);
+    EXPECT_EQ(Names(*copy->GetClass("X_B", kNone), &ICIMClass::EnumeratePropertyDecls), row.fDeclared);
     EXPECT_THAT(Names(*copy->GetClass("X_B", kNone), &ICIMClass::EnumerateMethodDecls), ElementsAre("Reset"));
   }
 }

@@ -57,9 +57,9 @@ protected:
 
 TEST_F(TCIMReferenceTest, ReadsPaths) {
   struct {
-    char const* path;
-    char const* className;
-    TNames keys;
+    char const* fPath;
+    char const* fClassName;
+    TNames fKeys;
   } const kRows[] = {
       {"X_Disk", "X_Disk", {}},
       {"ns:X_Disk", "X_Disk", {}},
@@ -78,11 +78,11 @@ TEST_F(TCIMReferenceTest, ReadsPaths) {
       {"ns:X_Disk.Id=\"none\"", "X_Disk", {"Id=0"}},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.path);
-    TCIMReference const reference = Parsed(row.path);
-    EXPECT_EQ(reference.GetClassName(), row.className);
-    EXPECT_EQ(reference.GetClass(), fNs->Class(row.className));
-    EXPECT_EQ(KeysOf(reference), row.keys);
+    SCOPED_TRACE(row.fPath);
+    TCIMReference const reference = Parsed(row.fPath);
+    EXPECT_EQ(reference.GetClassName(), row.fClassName);
+    EXPECT_EQ(reference.GetClass(), fNs->Class(row.fClassName));
+    EXPECT_EQ(KeysOf(reference), row.fKeys);
   }
 }
 
@@ -117,8 +117,8 @@ TEST_F(TCIMReferenceTest, WithoutNamespacePrefixAPathWithKeysIsAClassName) {
 // The class name that is looked up shows where each path is split.
 TEST_F(TCIMReferenceTest, SplitsOffTheClassName) {
   struct {
-    char const* path;
-    char const* className;
+    char const* fPath;
+    char const* fClassName;
   } const kRows[] = {
       {"", ""},
       {":", ""},
@@ -139,17 +139,17 @@ TEST_F(TCIMReferenceTest, SplitsOffTheClassName) {
       {"ns:Y.Name=\"a:b.c\"", "Y"},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.path);
+    SCOPED_TRACE(row.fPath);
     fNs->fCalls.fNames.clear();
-    EXPECT_STATUS(Parsed(row.path), kZEPStatusInvalidReference);
-    EXPECT_EQ(fNs->fCalls.fNames, TNames({row.className}));
+    EXPECT_STATUS(Parsed(row.fPath), kZEPStatusInvalidReference);
+    EXPECT_EQ(fNs->fCalls.fNames, TNames({row.fClassName}));
   }
 }
 
 TEST_F(TCIMReferenceTest, ReadsEscapes) {
   struct {
-    char const* written;
-    char const* read;
+    char const* fWritten;
+    char const* fRead;
   } const kRows[] = {
       {R"(a\"b)", R"(a"b)"},   // a quote
       {R"(a\\b)", R"(a\b)"},   // a backslash
@@ -158,9 +158,9 @@ TEST_F(TCIMReferenceTest, ReadsEscapes) {
       {R"(\\n)", R"(\n)"},    {R"(\,\=\.)", R"(\,\=\.)"}, {R"(\\\\)", R"(\\)"},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.written);
-    TCIMReference const disk = Parsed(std::string("ns:X_Disk.Name=\"") + row.written + "\",Id=\"1\"");
-    EXPECT_EQ(KeysOf(disk), TNames({"Id=1", std::string("Name=") + row.read}));
+    SCOPED_TRACE(row.fWritten);
+    TCIMReference const disk = Parsed(std::string("ns:X_Disk.Name=\"") + row.fWritten + "\",Id=\"1\"");
+    EXPECT_EQ(KeysOf(disk), TNames({"Id=1", std::string("Name=") + row.fRead}));
   }
 }
 
@@ -183,8 +183,8 @@ TEST_F(TCIMReferenceTest, AnyPropertyOfTheClassMayBeAKeyOfThePath) {
 
 TEST_F(TCIMReferenceTest, MalformedPathsAreLoggedAsOneErrorAndThrowInvalidReference) {
   struct {
-    char const* path;
-    char const* message;
+    char const* fPath;
+    char const* fMessage;
   } const kRows[] = {
       {"", "Reference specifies invalid class, path="},
       {"Y_Disk", "Reference specifies invalid class, path=Y_Disk"},
@@ -218,10 +218,10 @@ TEST_F(TCIMReferenceTest, MalformedPathsAreLoggedAsOneErrorAndThrowInvalidRefere
       {"ns:X_Disk.Id=\"5\",Name=\"a", "Reference missing closing '\"', path=ns:X_Disk.Id=\"5\",Name=\"a"},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.path);
+    SCOPED_TRACE(row.fPath);
     TLogCapture log;
-    EXPECT_STATUS(Parsed(row.path), kZEPStatusInvalidReference);
-    EXPECT_EQ(log.Entries(), TNames({std::string("[Error] ") + row.message}));
+    EXPECT_STATUS(Parsed(row.fPath), kZEPStatusInvalidReference);
+    EXPECT_EQ(log.Entries(), TNames({std::string("[Error] ") + row.fMessage}));
   }
 }
 
@@ -287,18 +287,18 @@ TEST_F(TCIMReferenceTest, FailuresOfReadingAValuePassThroughUnlogged) {
   fNs->Class("X_Disk")->Add("Made", ECIMType::kCIMTypeDateTime).Add("Names", nullStrings.GetType(), nullStrings);
   fNs->Class("X_Disk")->Add("Nothing", ECIMType::kCIMTypeInvalid);
   struct {
-    char const* path;
-    EZEPStatusCode status;
+    char const* fPath;
+    EZEPStatusCode fStatus;
   } const kRows[] = {
       {"ns:X_Disk.Id=\"5\",Made=\"yesterday\"", kZEPStatusInvalidDateTime},
       {"ns:X_Disk.Id=\"5\",Names=\"a\"", kZEPStatusTypeMismatch},
       {"ns:X_Disk.Id=\"5\",Nothing=\"a\"", kZEPStatusTypeMismatch},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.path);
+    SCOPED_TRACE(row.fPath);
     TLogCapture log;
     TCIMReference disk = Empty();
-    EXPECT_STATUS(disk.SetPath(row.path), row.status);
+    EXPECT_STATUS(disk.SetPath(row.fPath), row.fStatus);
     EXPECT_EQ(log.Entries(), TNames());
     EXPECT_EQ(KeysOf(disk), TNames({"Id=5"}));
   }
@@ -367,8 +367,8 @@ TEST_F(TCIMReferenceTest, AReferenceTypeWithoutAReferenceDefaultIsReadAsEscapedT
 // name.
 TEST_F(TCIMReferenceTest, ANestedPathNeedsAPrefixAndKeys) {
   struct {
-    char const* path;
-    char const* className;
+    char const* fPath;
+    char const* fClassName;
   } const kRows[] = {
       {"ns:X_Link.Disk=\"ns:X_Disk\"", "X_Disk\""},
       {"ns:X_Link.Disk=\"ns:X_Disk\",Port=\"1\"", "X_Disk\",Port=\"1\""},
@@ -378,12 +378,12 @@ TEST_F(TCIMReferenceTest, ANestedPathNeedsAPrefixAndKeys) {
       {"ns:X_Link.Disk=\"ns:X_Disk\",Port=\"a.b\"", "X_Disk\",Port=\"a"},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.path);
+    SCOPED_TRACE(row.fPath);
     fNs->fCalls.fNames.clear();
     TLogCapture log;
-    EXPECT_STATUS(Parsed(row.path), kZEPStatusInvalidReference);
-    EXPECT_EQ(fNs->fCalls.fNames, TNames({"X_Link", row.className}));
-    EXPECT_EQ(log.Entries(), TNames({std::string("[Error] Reference specifies invalid class, path=") + row.path}));
+    EXPECT_STATUS(Parsed(row.fPath), kZEPStatusInvalidReference);
+    EXPECT_EQ(fNs->fCalls.fNames, TNames({"X_Link", row.fClassName}));
+    EXPECT_EQ(log.Entries(), TNames({std::string("[Error] Reference specifies invalid class, path=") + row.fPath}));
   }
 }
 
@@ -418,9 +418,9 @@ TEST_F(TCIMReferenceTest, ReasonTravelsWithTheFailure) {
 
 TEST_F(TCIMReferenceTest, FailuresInANestedPathLogTheCompletePathOnce) {
   struct {
-    char const* path;
-    char const* message;
-    char const* left = "X_Link";  // a key is set when its value is complete
+    char const* fPath;
+    char const* fMessage;
+    char const* fLeft = "X_Link";  // a key is set when its value is complete
   } const kRows[] = {
       {"ns:X_Link.Disk=ns:X_Disk", "Reference missing opening '\"', path=ns:X_Link.Disk=ns:X_Disk"},
       {"ns:X_Link.Disk=\"", "Reference specifies invalid class, path=ns:X_Link.Disk=\""},
@@ -434,12 +434,12 @@ TEST_F(TCIMReferenceTest, FailuresInANestedPathLogTheCompletePathOnce) {
       {"ns:X_Link.Disk=\"ns:X_Disk.Id=\"5", "Reference missing closing '\"', path=ns:X_Link.Disk=\"ns:X_Disk.Id=\"5"},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.path);
+    SCOPED_TRACE(row.fPath);
     TLogCapture log;
     TCIMReference link = Empty();
-    EXPECT_STATUS(link.SetPath(row.path), kZEPStatusInvalidReference);
-    EXPECT_EQ(log.Entries(), TNames({std::string("[Error] ") + row.message}));
-    EXPECT_EQ(link.GetPath(), row.left);
+    EXPECT_STATUS(link.SetPath(row.fPath), kZEPStatusInvalidReference);
+    EXPECT_EQ(log.Entries(), TNames({std::string("[Error] ") + row.fMessage}));
+    EXPECT_EQ(link.GetPath(), row.fLeft);
   }
 }
 
@@ -678,9 +678,9 @@ TEST_F(TCIMReferenceTest, AddKeyValueOfAnotherTypeIsLoggedAndThrowsTypeMismatch)
   nullString.SetNullValue(ECIMType::kCIMTypeString, 0);
   TCIMReference disk = Disk(7);
   struct {
-    char const* name;
-    TCIMValue value;
-    char const* message;
+    char const* fName;
+    TCIMValue fValue;
+    char const* fMessage;
   } const kRows[] = {
       {"Id", TCIMValue(5), "Core: Declaration type: uint32 Value type: sint32"},
       {"Id", TCIMValue("5"), "Core: Declaration type: uint32 Value type: string"},
@@ -690,12 +690,12 @@ TEST_F(TCIMReferenceTest, AddKeyValueOfAnotherTypeIsLoggedAndThrowsTypeMismatch)
       {"Name", TCIMValue(ECIMType::kCIMTypeString, 4), "Core: Declaration type: string Value type: string"},  // an array
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.message);
+    SCOPED_TRACE(row.fMessage);
     TCIMReference reference = Empty();
     reference.SetClassName("X_Disk");
     TLogCapture log;
-    EXPECT_STATUS(reference.AddKeyValue(row.name, row.value), kZEPStatusTypeMismatch);
-    EXPECT_EQ(log.Entries(), TNames({std::string("[Error] ") + row.message}));
+    EXPECT_STATUS(reference.AddKeyValue(row.fName, row.fValue), kZEPStatusTypeMismatch);
+    EXPECT_EQ(log.Entries(), TNames({std::string("[Error] ") + row.fMessage}));
     EXPECT_EQ(reference.GetPath(), "X_Disk");
   }
 }

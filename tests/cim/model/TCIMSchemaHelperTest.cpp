@@ -27,10 +27,10 @@ TCIMValue Strings(TNames const& texts) {
 
 // A query, and the class and property that it reads.
 struct TSingleQuery {
-  char const* name;
-  TQuery query;
-  char const* className;
-  char const* property;
+  char const* fName;
+  TQuery fQuery;
+  char const* fClassName;
+  char const* fProperty;
 };
 
 std::vector<TSingleQuery> const& PlainQueries() {
@@ -121,10 +121,10 @@ TEST_F(TCIMSchemaHelperTest, ConstantsHaveTheirValues) {
 
 TEST_F(TCIMSchemaHelperTest, ASinglePropertyQueryReturnsThePropertyUnchangedAndLogsNothing) {
   for (auto const& row : AllSingleQueries()) {
-    SCOPED_TRACE(row.name);
+    SCOPED_TRACE(row.fName);
     TLogCapture log;
-    EXPECT_EQ(row.query(With(row.className, row.property, TCIMValue(" The text - as it is  "))), " The text - as it is  ");
-    EXPECT_EQ(row.query(With(row.className, row.property, TCIMValue(""))), "");
+    EXPECT_EQ(row.fQuery(With(row.fClassName, row.fProperty, TCIMValue(" The text - as it is  "))), " The text - as it is  ");
+    EXPECT_EQ(row.fQuery(With(row.fClassName, row.fProperty, TCIMValue(""))), "");
     EXPECT_EQ(log.Entries(), TNames());
   }
 }
@@ -133,48 +133,48 @@ TEST_F(TCIMSchemaHelperTest, MissingDataThrowsNotFound) {
   auto queries = AllSingleQueries();
   for (auto const& derived : DerivedQueries()) queries.push_back(derived);
   for (auto const& row : queries) {
-    SCOPED_TRACE(row.name);
+    SCOPED_TRACE(row.fName);
     auto const ns = boost::make_shared<TFakeNamespace>();
-    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // no class
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusNotFound);  // no class
     ns->fAnswersUnknownByEmpty = true;
-    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);
-    auto& cls = ns->Add(row.className);
-    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // no instance
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusNotFound);
+    auto& cls = ns->Add(row.fClassName);
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusNotFound);  // no instance
     auto const instance = cls.AddInstance();
-    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // no such property
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusNotFound);  // no such property
     instance->fCalls.fFailure = kZEPStatusNotFound;
-    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusNotFound);
     instance->fCalls.fFailure.reset();
-    instance->Add(row.property, TCIMValue("1234ABC"));
+    instance->Add(row.fProperty, TCIMValue("1234ABC"));
     cls.fEnumerationFailure = kZEPStatusNotFound;
-    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // no instances to enumerate
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusNotFound);  // no instances to enumerate
     cls.fEnumerationFailure.reset();
-    cls.AddInstance()->Add(row.property, TCIMValue("1234ABC"));
-    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);  // two instances
+    cls.AddInstance()->Add(row.fProperty, TCIMValue("1234ABC"));
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusNotFound);  // two instances
   }
 }
 
 TEST_F(TCIMSchemaHelperTest, PlainQueriesLogNoFailure) {
   for (auto const& row : PlainQueries()) {
-    SCOPED_TRACE(row.name);
+    SCOPED_TRACE(row.fName);
     TLogCapture log;
     auto const ns = boost::make_shared<TFakeNamespace>();
-    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);
-    ns->Add(row.className);
-    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);
-    ns->Class(row.className)->AddInstance();
-    EXPECT_STATUS(row.query(ns), kZEPStatusNotFound);
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusNotFound);
+    ns->Add(row.fClassName);
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusNotFound);
+    ns->Class(row.fClassName)->AddInstance();
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusNotFound);
     EXPECT_EQ(log.Entries(), TNames());
   }
 }
 
 TEST_F(TCIMSchemaHelperTest, PlainQueriesThrowWhatTheConversionThrows) {
   for (auto const& row : PlainQueries()) {
-    SCOPED_TRACE(row.name);
+    SCOPED_TRACE(row.fName);
     TLogCapture log;
-    EXPECT_STATUS(row.query(With(row.className, row.property, NullOf(ECIMType::kCIMTypeString))), kZEPStatusValueIsNULL);
-    EXPECT_STATUS(row.query(With(row.className, row.property, TCIMValue(5u))), kZEPStatusTypeMismatch);
-    EXPECT_STATUS(row.query(With(row.className, row.property, Strings({"a"}))), kZEPStatusTypeMismatch);
+    EXPECT_STATUS(row.fQuery(With(row.fClassName, row.fProperty, NullOf(ECIMType::kCIMTypeString))), kZEPStatusValueIsNULL);
+    EXPECT_STATUS(row.fQuery(With(row.fClassName, row.fProperty, TCIMValue(5u))), kZEPStatusTypeMismatch);
+    EXPECT_STATUS(row.fQuery(With(row.fClassName, row.fProperty, Strings({"a"}))), kZEPStatusTypeMismatch);
     EXPECT_EQ(log.Entries(), TNames());
   }
 }
@@ -183,19 +183,19 @@ TEST_F(TCIMSchemaHelperTest, OtherFailuresOfTheNamespacePassThrough) {
   auto queries = AllSingleQueries();
   for (auto const& derived : DerivedQueries()) queries.push_back(derived);
   for (auto const& row : queries) {
-    SCOPED_TRACE(row.name);
-    auto const ns = With(row.className, row.property, TCIMValue("1234ABC"));
+    SCOPED_TRACE(row.fName);
+    auto const ns = With(row.fClassName, row.fProperty, TCIMValue("1234ABC"));
     TLogCapture log;
     ns->fCalls.fFailure = kZEPStatusConnectionFailed;
-    EXPECT_STATUS(row.query(ns), kZEPStatusConnectionFailed);
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusConnectionFailed);
     ns->fCalls.fFailure.reset();
-    auto& cls = *ns->Class(row.className);
+    auto& cls = *ns->Class(row.fClassName);
     cls.fEnumerationFailure = kZEPStatusAccessDenied;
-    EXPECT_STATUS(row.query(ns), kZEPStatusAccessDenied);
+    EXPECT_STATUS(row.fQuery(ns), kZEPStatusAccessDenied);
     cls.fEnumerationFailure.reset();
-    auto const broken = With(row.className, row.property, TCIMValue("1234ABC"));
-    broken->Class(row.className)->OnlyInstance().fCalls.fFailure = kZEPStatusFail;
-    EXPECT_STATUS(row.query(broken), kZEPStatusFail);
+    auto const broken = With(row.fClassName, row.fProperty, TCIMValue("1234ABC"));
+    broken->Class(row.fClassName)->OnlyInstance().fCalls.fFailure = kZEPStatusFail;
+    EXPECT_STATUS(row.fQuery(broken), kZEPStatusFail);
     for (auto const& entry : log.Entries()) EXPECT_EQ(entry, "[Debug] TCIMSchemaHelper- Detected MTM Entered");
   }
 }
@@ -209,27 +209,27 @@ TEST_F(TCIMSchemaHelperTest, EveryCallPassesTheProviderNameInItsContext) {
   auto queries = AllSingleQueries();
   for (auto const& derived : DerivedQueries()) queries.push_back(derived);
   for (auto const& row : queries) {
-    SCOPED_TRACE(row.name);
+    SCOPED_TRACE(row.fName);
     auto const ns = boost::make_shared<TFakeNamespace>();
-    auto const instance = ns->Add(row.className).AddInstance();
-    auto const property = instance->Add(row.property, TCIMValue("1234ABC"));
+    auto const instance = ns->Add(row.fClassName).AddInstance();
+    auto const property = instance->Add(row.fProperty, TCIMValue("1234ABC"));
     try {
-      row.query(ns);
+      row.fQuery(ns);
     } catch (TZEPException const&) {  // the text is not a version, but it has been read
     }
     TCIMContext const expected = {{"nspID", TCIMValue("plugin")}};
-    for (TCalls const* calls : {&ns->fCalls, &ns->Class(row.className)->fCalls, &instance->fCalls, &property->fCalls})
+    for (TCalls const* calls : {&ns->fCalls, &ns->Class(row.fClassName)->fCalls, &instance->fCalls, &property->fCalls})
       EXPECT_EQ(calls->fContexts, std::vector<TCIMContext>{expected});
-    EXPECT_EQ(ns->fCalls.fNames, TNames({row.className}));
-    EXPECT_EQ(instance->fCalls.fNames, TNames({row.property}));
+    EXPECT_EQ(ns->fCalls.fNames, TNames({row.fClassName}));
+    EXPECT_EQ(instance->fCalls.fNames, TNames({row.fProperty}));
   }
 }
 
 TEST_F(TCIMSchemaHelperTest, TheCallersContextIsPassedOnAndMayNameTheProvider) {
   using THelper = TCIMSchemaHelper;
   struct {
-    char const* name;
-    std::function<std::string(TNamespace, TCIMContext)> query;
+    char const* fName;
+    std::function<std::string(TNamespace, TCIMContext)> fQuery;
   } const kRows[] = {
       {"GetDataSourceVersion", THelper::GetDataSourceVersion},
       {"GetDataSourceBuild", THelper::GetDataSourceBuild},
@@ -240,10 +240,10 @@ TEST_F(TCIMSchemaHelperTest, TheCallersContextIsPassedOnAndMayNameTheProvider) {
       {"GetSerialNumber_vmwesxi", THelper::GetSerialNumber_vmwesxi},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.name);
+    SCOPED_TRACE(row.fName);
     auto const ns = boost::make_shared<TFakeNamespace>();
-    EXPECT_STATUS(row.query(ns, {{"who", TCIMValue("me")}}), kZEPStatusNotFound);
-    EXPECT_STATUS(row.query(ns, {{"nspID", TCIMValue("cmpi")}}), kZEPStatusNotFound);
+    EXPECT_STATUS(row.fQuery(ns, {{"who", TCIMValue("me")}}), kZEPStatusNotFound);
+    EXPECT_STATUS(row.fQuery(ns, {{"nspID", TCIMValue("cmpi")}}), kZEPStatusNotFound);
     EXPECT_EQ(ns->fCalls.fContexts, (std::vector<TCIMContext>{{{"nspID", TCIMValue("plugin")}, {"who", TCIMValue("me")}},
                                                               {{"nspID", TCIMValue("cmpi")}}}));
   }
@@ -251,8 +251,8 @@ TEST_F(TCIMSchemaHelperTest, TheCallersContextIsPassedOnAndMayNameTheProvider) {
 
 TEST_F(TCIMSchemaHelperTest, LoggedQueriesLogEachReasonAtDebug) {
   for (auto const& row : LoggedQueries()) {
-    SCOPED_TRACE(row.name);
-    std::string const property = row.property;
+    SCOPED_TRACE(row.fName);
+    std::string const property = row.fProperty;
     auto const none = boost::make_shared<TFakeNamespace>();
     auto const noInstance = boost::make_shared<TFakeNamespace>();
     noInstance->Add("QRVSG_ComputerSystem");
@@ -262,8 +262,8 @@ TEST_F(TCIMSchemaHelperTest, LoggedQueriesLogEachReasonAtDebug) {
     two->Class("QRVSG_ComputerSystem")->AddInstance();
     auto const noProperty = With("QRVSG_ComputerSystem", "Other", TCIMValue("1234ABC"));
     struct {
-      TNamespace ns;
-      std::string message;
+      TNamespace fNs;
+      std::string fMessage;
     } const kReasons[] = {
         {none, "TCIMSchemaHelper: no computer system"},
         {noInstance, "TCIMSchemaHelper: computer system instances != 1"},
@@ -276,10 +276,10 @@ TEST_F(TCIMSchemaHelperTest, LoggedQueriesLogEachReasonAtDebug) {
         {With("QRVSG_ComputerSystem", property, Strings({"1234ABC"})), "TCIMSchemaHelper: " + property + " wasn't a string"},
     };
     for (auto const& reason : kReasons) {
-      SCOPED_TRACE(reason.message);
+      SCOPED_TRACE(reason.fMessage);
       TLogCapture log;
-      EXPECT_STATUS(row.query(reason.ns), kZEPStatusNotFound);
-      EXPECT_EQ(log.Entries(), TNames({"[Debug] " + reason.message}));
+      EXPECT_STATUS(row.fQuery(reason.fNs), kZEPStatusNotFound);
+      EXPECT_EQ(log.Entries(), TNames({"[Debug] " + reason.fMessage}));
     }
   }
 }
@@ -312,8 +312,8 @@ TEST_F(TCIMSchemaHelperTest, IsValidMTMChecksTheFirstSevenCharacters) {
 }
 
 struct TProductNameRow {
-  char const* productName;
-  char const* mtm;  // null: the name contains no MTM
+  char const* fProductName;
+  char const* fMtm;  // null: the name contains no MTM
 };
 
 TEST_F(TCIMSchemaHelperTest, FindsTheMTMInAProductName) {
@@ -366,15 +366,15 @@ TEST_F(TCIMSchemaHelperTest, FindsTheMTMInAProductName) {
       {"1234-[", nullptr},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.productName);
-    auto const ns = WithProductName(TCIMValue(row.productName));
-    if (row.mtm == nullptr) {
+    SCOPED_TRACE(row.fProductName);
+    auto const ns = WithProductName(TCIMValue(row.fProductName));
+    if (row.fMtm == nullptr) {
       EXPECT_STATUS(TCIMSchemaHelper::GetMTM(ns), kZEPStatusInvalidFormat);
       continue;
     }
-    EXPECT_EQ(TCIMSchemaHelper::GetMTM(ns), row.mtm);
-    EXPECT_EQ(TCIMSchemaHelper::GetMachineType(ns), std::string(row.mtm).substr(0, 4));
-    EXPECT_EQ(TCIMSchemaHelper::GetModelNumber(ns), std::string(row.mtm).substr(4));
+    EXPECT_EQ(TCIMSchemaHelper::GetMTM(ns), row.fMtm);
+    EXPECT_EQ(TCIMSchemaHelper::GetMachineType(ns), std::string(row.fMtm).substr(0, 4));
+    EXPECT_EQ(TCIMSchemaHelper::GetModelNumber(ns), std::string(row.fMtm).substr(4));
   }
 }
 
@@ -400,12 +400,12 @@ TEST_F(TCIMSchemaHelperTest, FindsTheMTMInLegacyProductNames) {
       {"system Model 3000- 1234ABC--", nullptr},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.productName);
-    auto const ns = WithProductName(TCIMValue(row.productName));
-    if (row.mtm == nullptr)
+    SCOPED_TRACE(row.fProductName);
+    auto const ns = WithProductName(TCIMValue(row.fProductName));
+    if (row.fMtm == nullptr)
       EXPECT_STATUS(TCIMSchemaHelper::GetMTM(ns), kZEPStatusInvalidFormat);
     else
-      EXPECT_EQ(TCIMSchemaHelper::GetMTM(ns), row.mtm);
+      EXPECT_EQ(TCIMSchemaHelper::GetMTM(ns), row.fMtm);
   }
 }
 
@@ -432,8 +432,8 @@ TEST_F(TCIMSchemaHelperTest, GetMTMLogsOnlyItsStartBeforeAFailure) {
 
 TEST_F(TCIMSchemaHelperTest, ASerialNumberIsSevenLettersOrDigits) {
   struct {
-    char const* serialNumber;
-    char const* result;  // null: not in the expected form
+    char const* fSerialNumber;
+    char const* fResult;  // null: not in the expected form
   } const kRows[] = {
       {"KQ1234A", "KQ1234A"},     {"1234567", "1234567"}, {"abcdefg", "abcdefg"}, {"KQ1234A ", "KQ1234A"},
       {"KQ1234A    ", "KQ1234A"}, {"KQ1234AB", nullptr},  {"KQ1234", nullptr},    {"KQ1234 ", nullptr},
@@ -441,13 +441,13 @@ TEST_F(TCIMSchemaHelperTest, ASerialNumberIsSevenLettersOrDigits) {
       {"KQ1234\xe4", nullptr},    {"", nullptr},          {"       ", nullptr},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.serialNumber);
-    auto const ns = WithSerialNumber(TCIMValue(row.serialNumber));
+    SCOPED_TRACE(row.fSerialNumber);
+    auto const ns = WithSerialNumber(TCIMValue(row.fSerialNumber));
     TLogCapture log;
-    if (row.result == nullptr)
+    if (row.fResult == nullptr)
       EXPECT_STATUS(TCIMSchemaHelper::GetSerialNumber(ns, TCIMContext()), kZEPStatusInvalidFormat);
     else
-      EXPECT_EQ(TCIMSchemaHelper::GetSerialNumber(ns, TCIMContext()), row.result);
+      EXPECT_EQ(TCIMSchemaHelper::GetSerialNumber(ns, TCIMContext()), row.fResult);
     EXPECT_EQ(log.Entries(), TNames());
   }
 }
@@ -460,10 +460,10 @@ TEST_F(TCIMSchemaHelperTest, ARawSerialNumberKeepsItsBlanks) {
 
 TEST_F(TCIMSchemaHelperTest, TheVersionIsSplitAtItsDots) {
   struct {
-    char const* version;
-    char const* major;  // null: not found
-    char const* minor;
-    char const* build;
+    char const* fVersion;
+    char const* fMajor;  // null: not found
+    char const* fMinor;
+    char const* fBuild;
   } const kRows[] = {
       {"3.20.5", "3", "20", "5"},
       {"3.20.5.77", "3", "20", "77"},
@@ -477,26 +477,26 @@ TEST_F(TCIMSchemaHelperTest, TheVersionIsSplitAtItsDots) {
   };
   using THelper = TCIMSchemaHelper;
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.version);
-    auto const ns = WithVersion(TCIMValue(row.version));
+    SCOPED_TRACE(row.fVersion);
+    auto const ns = WithVersion(TCIMValue(row.fVersion));
     struct {
-      char const* expected;
-      TQuery query;
-      TNames logged;
+      char const* fExpected;
+      TQuery fQuery;
+      TNames fLogged;
     } const kParts[] = {
-        {row.major,
+        {row.fMajor,
          [](TNamespace of) { return THelper::GetDataSourceMajorVersion(of, TCIMContext()); },
          {"[Debug] TCIMSchemaHelper::GetDataSourceMajorVersion - Throwing"}},
-        {row.minor, [](TNamespace of) { return THelper::GetDataSourceMinorVersion(of, TCIMContext()); }, {}},
-        {row.build, THelper::GetDataSourceBuildVersion, {}},
+        {row.fMinor, [](TNamespace of) { return THelper::GetDataSourceMinorVersion(of, TCIMContext()); }, {}},
+        {row.fBuild, THelper::GetDataSourceBuildVersion, {}},
     };
     for (auto const& part : kParts) {
       TLogCapture log;
-      if (part.expected == nullptr)
-        EXPECT_STATUS(part.query(ns), kZEPStatusNotFound);
+      if (part.fExpected == nullptr)
+        EXPECT_STATUS(part.fQuery(ns), kZEPStatusNotFound);
       else
-        EXPECT_EQ(part.query(ns), part.expected);
-      EXPECT_EQ(log.Entries(), part.expected == nullptr ? part.logged : TNames());
+        EXPECT_EQ(part.fQuery(ns), part.fExpected);
+      EXPECT_EQ(log.Entries(), part.fExpected == nullptr ? part.fLogged : TNames());
     }
   }
 }
@@ -553,8 +553,8 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheLastModelWithBothBracketsIsTheProductName) {
 
 TEST_F(TCIMSchemaHelperEsxiTest, TheMTMIsTheTextBetweenTheFirstBrackets) {
   struct {
-    char const* model;
-    char const* mtm;
+    char const* fModel;
+    char const* fMtm;
   } const kRows[] = {
       {"Server X1-[1234ABC]-", "1234ABC"},
       {"Server X1-[12]-", "12"},  // any length, any characters
@@ -567,10 +567,10 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheMTMIsTheTextBetweenTheFirstBrackets) {
       {"Server X1", "Unknown"},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.model);
+    SCOPED_TRACE(row.fModel);
     auto const ns = boost::make_shared<TFakeNamespace>();
-    ns->Add("CIM_PhysicalElement").AddInstance()->Add("Model", TCIMValue(row.model));
-    EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(ns), row.mtm);
+    ns->Add("CIM_PhysicalElement").AddInstance()->Add("Model", TCIMValue(row.fModel));
+    EXPECT_EQ(TCIMSchemaHelper::GetMTM_vmwesxi(ns), row.fMtm);
   }
 }
 
@@ -615,26 +615,26 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheSerialNumberIsThatOfTheLastChassisThatHasOne
 
 TEST_F(TCIMSchemaHelperEsxiTest, APlaceholderIsReplacedByTheOtherIdentifyingInfo) {
   struct {
-    char const* serialNumber;
-    char const* result;
+    char const* fSerialNumber;
+    char const* fResult;
   } const kRows[] = {
       {"XxXxXxX", "KQ1234A"}, {"none", "KQ1234A"}, {"None", "None"}, {"xxxxxxx", "xxxxxxx"}, {"none ", "none "}, {"", ""},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.serialNumber);
+    SCOPED_TRACE(row.fSerialNumber);
     auto const ns = boost::make_shared<TFakeNamespace>();
-    ns->Add("OMC_Chassis").AddInstance()->Add("SerialNumber", TCIMValue(row.serialNumber));
+    ns->Add("OMC_Chassis").AddInstance()->Add("SerialNumber", TCIMValue(row.fSerialNumber));
     ns->Add("OMC_UnitaryComputerSystem").AddInstance()->Add("OtherIdentifyingInfo", Strings({"x", "SN:KQ1234A", "UUID:0"}));
-    EXPECT_EQ(TCIMSchemaHelper::GetSerialNumber_vmwesxi(ns, TCIMContext()), row.result);
+    EXPECT_EQ(TCIMSchemaHelper::GetSerialNumber_vmwesxi(ns, TCIMContext()), row.fResult);
   }
 }
 
 TEST_F(TCIMSchemaHelperEsxiTest, TheOtherIdentifyingInfoIsTheTextAfterTheColonOfTheFirstEntryWithOne) {
   TCIMValue const withNull(ECIMType::kCIMTypeString, 0, {NullOf(ECIMType::kCIMTypeString), TCIMValue("SN:A")});
   struct {
-    char const* what;
-    TCIMValue info;
-    char const* result;
+    char const* fWhat;
+    TCIMValue fInfo;
+    char const* fResult;
   } const kRows[] = {
       {"two with a colon", Strings({"a:b:c", "d:e"}), "b:c"},
       {"blanks", Strings({"SN: KQ1234A "}), " KQ1234A "},
@@ -649,11 +649,11 @@ TEST_F(TCIMSchemaHelperEsxiTest, TheOtherIdentifyingInfoIsTheTextAfterTheColonOf
       {"a NULL array", TCIMValue(ECIMType::kCIMTypeString, 4), "Unknown"},
   };
   for (auto const& row : kRows) {
-    SCOPED_TRACE(row.what);
+    SCOPED_TRACE(row.fWhat);
     auto const ns = boost::make_shared<TFakeNamespace>();
     ns->Add("OMC_Chassis").AddInstance()->Add("SerialNumber", TCIMValue("none"));
-    ns->Add("OMC_UnitaryComputerSystem").AddInstance()->Add("OtherIdentifyingInfo", row.info);
-    EXPECT_EQ(TCIMSchemaHelper::GetSerialNumber_vmwesxi(ns, TCIMContext()), row.result);
+    ns->Add("OMC_UnitaryComputerSystem").AddInstance()->Add("OtherIdentifyingInfo", row.fInfo);
+    EXPECT_EQ(TCIMSchemaHelper::GetSerialNumber_vmwesxi(ns, TCIMContext()), row.fResult);
   }
 }
 

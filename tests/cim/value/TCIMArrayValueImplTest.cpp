@@ -112,10 +112,10 @@ TEST(TCIMArrayValueImplTest, RefusesEveryScalarConversion) {
 }
 
 struct TEqualityRow {
-  char const* what;
-  TElements mine;
-  TCIMValue other;
-  bool equal;
+  char const* fWhat;
+  TElements fMine;
+  TCIMValue fOther;
+  bool fEqual;
 };
 
 TEST(TCIMArrayValueImplTest, ArraysWithEqualElementsInOrderAreEqual) {
@@ -140,7 +140,7 @@ TEST(TCIMArrayValueImplTest, ArraysWithEqualElementsInOrderAreEqual) {
       {"a scalar", {Uint8(1)}, Uint8(1), false},
       {"a NULL scalar", {}, TCIMValue(), false},
   };
-  for (auto const& row : rows) EXPECT_EQ(TImpl(row.mine) == row.other, row.equal) << row.what;
+  for (auto const& row : rows) EXPECT_EQ(TImpl(row.fMine) == row.fOther, row.fEqual) << row.fWhat;
 }
 
 TEST(TCIMArrayValueImplTest, ComparingWithANullArrayThrowsValueIsNull) {

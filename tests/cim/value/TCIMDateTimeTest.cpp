@@ -147,10 +147,10 @@ TEST_F(TCIMDateTimeTest, SetChangesTheKind) {
 
 TEST_F(TCIMDateTimeTest, IntervalFieldsExceptTheDaysAreLimited) {
   struct TRow {
-    unsigned int days;
-    unsigned short hours, minutes, seconds;
-    unsigned int microSeconds;
-    bool isValid;
+    unsigned int fDays;
+    unsigned short fHours, fMinutes, fSeconds;
+    unsigned int fMicroSeconds;
+    bool fIsValid;
   };
   TRow const rows[] = {
       {0, 0, 0, 0, 0, true},          {0, 23, 59, 59, 999999, true},  {kMaxInt, 23, 59, 59, 999999, true},
@@ -159,30 +159,30 @@ TEST_F(TCIMDateTimeTest, IntervalFieldsExceptTheDaysAreLimited) {
       {0, 0, 0, kMaxShort, 0, false}, {0, 0, 0, 0, 1000000, false},   {0, 0, 0, 0, kMaxInt, false},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(testing::Message() << row.days << ' ' << row.hours << ' ' << row.minutes << ' ' << row.seconds << ' '
-                                    << row.microSeconds);
-    EXPECT_EQ(TCIMDateTimeImpl::IsValid(row.days, row.hours, row.minutes, row.seconds, row.microSeconds), row.isValid);
+    SCOPED_TRACE(testing::Message() << row.fDays << ' ' << row.fHours << ' ' << row.fMinutes << ' ' << row.fSeconds << ' '
+                                    << row.fMicroSeconds);
+    EXPECT_EQ(TCIMDateTimeImpl::IsValid(row.fDays, row.fHours, row.fMinutes, row.fSeconds, row.fMicroSeconds), row.fIsValid);
     TCIMDateTime interval = At("20070315143000.000000+060");
-    if (row.isValid) {
-      interval.Set(row.days, row.hours, row.minutes, row.seconds, row.microSeconds);
+    if (row.fIsValid) {
+      interval.Set(row.fDays, row.fHours, row.fMinutes, row.fSeconds, row.fMicroSeconds);
       EXPECT_TRUE(interval.IsInterval());
       continue;
     }
-    EXPECT_STATUS(interval.Set(row.days, row.hours, row.minutes, row.seconds, row.microSeconds), kZEPStatusInvalidDateTime);
-    EXPECT_STATUS(TCIMDateTime(row.days, row.hours, row.minutes, row.seconds, row.microSeconds), kZEPStatusInvalidDateTime);
+    EXPECT_STATUS(interval.Set(row.fDays, row.fHours, row.fMinutes, row.fSeconds, row.fMicroSeconds), kZEPStatusInvalidDateTime);
+    EXPECT_STATUS(TCIMDateTime(row.fDays, row.fHours, row.fMinutes, row.fSeconds, row.fMicroSeconds), kZEPStatusInvalidDateTime);
     EXPECT_EQ(interval.ToString(), "20070315143000.000000+060");
   }
 }
 
 TEST_F(TCIMDateTimeTest, TimestampIsValidUnlessMktimeReturnsMinusOne) {
   struct TRow {
-    char const* zone;
-    unsigned short year, month;
-    unsigned int day;
-    unsigned short hour, minute, second;
-    unsigned int microSeconds;
-    short utcOffset;
-    bool isValid;
+    char const* fZone;
+    unsigned short fYear, fMonth;
+    unsigned int fDay;
+    unsigned short fHour, fMinute, fSecond;
+    unsigned int fMicroSeconds;
+    short fUtcOffset;
+    bool fIsValid;
   };
   TRow const rows[] = {
       {kUTC, 2007, 3, 15, 14, 30, 0, 0, 60, true},
@@ -214,17 +214,18 @@ TEST_F(TCIMDateTimeTest, TimestampIsValidUnlessMktimeReturnsMinusOne) {
       {kEastHour, 1970, 1, 1, 0, 59, 59, 0, 0, true},  // here too
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(testing::Message() << row.zone << ' ' << row.year << '-' << row.month << '-' << row.day << ' ' << row.hour << ':'
-                                    << row.minute << ':' << row.second << ' ' << row.microSeconds << ' ' << row.utcOffset);
-    TEnvironmentGuard const zone("TZ", row.zone);
-    EXPECT_EQ(TCIMDateTimeImpl::IsValid(row.year, row.month, row.day, row.hour, row.minute, row.second, row.microSeconds,
-                                        row.utcOffset),
-              row.isValid);
+    SCOPED_TRACE(testing::Message() << row.fZone << ' ' << row.fYear << '-' << row.fMonth << '-' << row.fDay << ' ' << row.fHour
+                                    << ':' << row.fMinute << ':' << row.fSecond << ' ' << row.fMicroSeconds << ' '
+                                    << row.fUtcOffset);
+    TEnvironmentGuard const zone("TZ", row.fZone);
+    EXPECT_EQ(TCIMDateTimeImpl::IsValid(row.fYear, row.fMonth, row.fDay, row.fHour, row.fMinute, row.fSecond, row.fMicroSeconds,
+                                        row.fUtcOffset),
+              row.fIsValid);
     TCIMDateTime dateTime(1, 2, 3, 4, 5);
     auto const set = [&] {
-      dateTime.Set(row.year, row.month, row.day, row.hour, row.minute, row.second, row.microSeconds, row.utcOffset);
+      dateTime.Set(row.fYear, row.fMonth, row.fDay, row.fHour, row.fMinute, row.fSecond, row.fMicroSeconds, row.fUtcOffset);
     };
-    if (row.isValid) {
+    if (row.fIsValid) {
       EXPECT_NO_THROW(set());
       EXPECT_FALSE(dateTime.IsInterval());
       continue;
@@ -262,22 +263,22 @@ TEST_F(TCIMDateTimeTest, ValidationAgreesWithMktimeInEveryZone) {
 
 TEST_F(TCIMDateTimeTest, ATimeThatItsZoneSkippedIsInvalid) {
   struct {
-    char const *zone, *text;
+    char const *fZone, *fText;
   } const rows[] = {
       {"Asia/Kathmandu", "19860101000500.000000+000"},  {"Europe/Moscow", "20110327023000.000000+000"},
       {"Asia/Singapore", "19811231233000.000000+000"},  {"America/Caracas", "20160501024500.000000+000"},
       {"Pacific/Fakaofo", "20111230120000.000000+000"}, {"Pacific/Fakaofo", "20111230130000.000000+060"},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.zone);
-    NEEDS(std::filesystem::exists(std::string("/usr/share/zoneinfo/") + row.zone), "the zones (package tzdata)");
-    TEnvironmentGuard const zone("TZ", row.zone);
+    SCOPED_TRACE(row.fZone);
+    NEEDS(std::filesystem::exists(std::string("/usr/share/zoneinfo/") + row.fZone), "the zones (package tzdata)");
+    TEnvironmentGuard const zone("TZ", row.fZone);
     TCIMDateTime dateTime = At("20070315143000.000000+060");
-    EXPECT_STATUS(dateTime = At(row.text), kZEPStatusInvalidDateTime);
-    EXPECT_STATUS(dateTime.Set(row.text), kZEPStatusInvalidDateTime);
+    EXPECT_STATUS(dateTime = At(row.fText), kZEPStatusInvalidDateTime);
+    EXPECT_STATUS(dateTime.Set(row.fText), kZEPStatusInvalidDateTime);
     EXPECT_EQ(dateTime.ToString(), "20070315143000.000000+060");
     ::setenv("TZ", "UTC0", 1);
-    EXPECT_NO_THROW(dateTime.Set(row.text));
+    EXPECT_NO_THROW(dateTime.Set(row.fText));
   }
 }
 
@@ -309,8 +310,8 @@ TEST_F(TCIMDateTimeTest, ReadsAnInterval) {
 
 TEST_F(TCIMDateTimeTest, PrintsTheTextThatItRead) {
   struct TRow {
-    char const* text;
-    char const* printed;
+    char const* fText;
+    char const* fPrinted;
   };
   TRow const rows[] = {
       {"20070315143000.000000+060", "20070315143000.000000+060"},
@@ -334,8 +335,8 @@ TEST_F(TCIMDateTimeTest, PrintsTheTextThatItRead) {
       {"00000001020304.000005:123", "00000001020304.000005:000"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.text);
-    EXPECT_EQ(At(row.text).ToString(), row.printed);
+    SCOPED_TRACE(row.fText);
+    EXPECT_EQ(At(row.fText).ToString(), row.fPrinted);
   }
 }
 
@@ -442,10 +443,10 @@ TEST_F(TCIMDateTimeTest, PrintsLikePrintf) {
 
 TEST_F(TCIMDateTimeTest, ReadableIntervalNamesEachPartThatIsNotZero) {
   struct TRow {
-    unsigned int days;
-    unsigned short hours, minutes, seconds;
-    unsigned int microSeconds;
-    char const* text;
+    unsigned int fDays;
+    unsigned short fHours, fMinutes, fSeconds;
+    unsigned int fMicroSeconds;
+    char const* fText;
   };
   TRow const rows[] = {
       {0, 0, 0, 0, 0, ""},
@@ -470,7 +471,7 @@ TEST_F(TCIMDateTimeTest, ReadableIntervalNamesEachPartThatIsNotZero) {
       {10, 11, 10, 21, 101000, "10 days 11 hours 10 minutes 21 seconds 101 milliseconds "},
   };
   for (TRow const& row : rows)
-    EXPECT_EQ(TCIMDateTime(row.days, row.hours, row.minutes, row.seconds, row.microSeconds).ToUIString(), row.text);
+    EXPECT_EQ(TCIMDateTime(row.fDays, row.fHours, row.fMinutes, row.fSeconds, row.fMicroSeconds).ToUIString(), row.fText);
 }
 
 TEST_F(TCIMDateTimeTest, ReadableTimestampHasNeitherMicrosecondsNorOffset) {
@@ -484,10 +485,10 @@ TEST_F(TCIMDateTimeTest, ReadableTimestampHasNeitherMicrosecondsNorOffset) {
 // ---- Comparison ----
 
 struct TOrderRow {
-  char const* zone;
-  char const* left;
-  char const* right;
-  int order;  // -1, 0 or 1: left is less, equal, greater
+  char const* fZone;
+  char const* fLeft;
+  char const* fRight;
+  int fOrder;  // -1, 0 or 1: left is less, equal, greater
 };
 
 TEST_F(TCIMDateTimeTest, ComparesTimestampsByInstantAndThenMicroseconds) {
@@ -513,13 +514,13 @@ TEST_F(TCIMDateTimeTest, ComparesTimestampsByInstantAndThenMicroseconds) {
       {kUTC, "19700101000000.000000+000", "19700101000001.000000+000", -1},
   };
   for (TOrderRow const& row : rows) {
-    SCOPED_TRACE(testing::Message() << row.zone << ": " << row.left << " and " << row.right);
-    TEnvironmentGuard const zone("TZ", row.zone);
-    TCIMDateTime const left = At(row.left), right = At(row.right);
-    EXPECT_EQ(left == right, row.order == 0);
-    EXPECT_EQ(right == left, row.order == 0);
-    EXPECT_EQ(left < right, row.order < 0);
-    EXPECT_EQ(right<left, row.order> 0);
+    SCOPED_TRACE(testing::Message() << row.fZone << ": " << row.fLeft << " and " << row.fRight);
+    TEnvironmentGuard const zone("TZ", row.fZone);
+    TCIMDateTime const left = At(row.fLeft), right = At(row.fRight);
+    EXPECT_EQ(left == right, row.fOrder == 0);
+    EXPECT_EQ(right == left, row.fOrder == 0);
+    EXPECT_EQ(left < right, row.fOrder < 0);
+    EXPECT_EQ(right<left, row.fOrder> 0);
   }
 }
 
@@ -534,11 +535,11 @@ TEST_F(TCIMDateTimeTest, ComparesIntervalsByLengthAndThenMicroseconds) {
       {kUTC, "00000000005900.000000:000", "00000000010000.000000:000", -1},
   };
   for (TOrderRow const& row : rows) {
-    SCOPED_TRACE(testing::Message() << row.left << " and " << row.right);
-    TCIMDateTime const left = At(row.left), right = At(row.right);
-    EXPECT_EQ(left == right, row.order == 0);
-    EXPECT_EQ(left < right, row.order < 0);
-    EXPECT_EQ(right<left, row.order> 0);
+    SCOPED_TRACE(testing::Message() << row.fLeft << " and " << row.fRight);
+    TCIMDateTime const left = At(row.fLeft), right = At(row.fRight);
+    EXPECT_EQ(left == right, row.fOrder == 0);
+    EXPECT_EQ(left < right, row.fOrder < 0);
+    EXPECT_EQ(right<left, row.fOrder> 0);
   }
   EXPECT_TRUE(TCIMDateTime(4294967294u, 23, 59, 59, 0) < TCIMDateTime(4294967295u, 0, 0, 0, 0));
 }
@@ -574,22 +575,22 @@ TEST_F(TCIMDateTimeTest, AnInstantThatMktimeReportsAsMinusOneCannotBeComparedOrA
 // ---- Arithmetic ----
 
 struct TArithmeticRow {
-  char const* zone;
-  char const* left;
-  char operation;
-  char const* right;
-  char const* result;
+  char const* fZone;
+  char const* fLeft;
+  char fOperation;
+  char const* fRight;
+  char const* fResult;
 };
 
 void ExpectResult(TArithmeticRow const& row) {
-  SCOPED_TRACE(testing::Message() << row.zone << ": " << row.left << ' ' << row.operation << ' ' << row.right);
-  TEnvironmentGuard const zone("TZ", row.zone);
-  TCIMDateTime const left = At(row.left), right = At(row.right);
-  TCIMDateTime const result = row.operation == '+' ? left + right : left - right;
-  EXPECT_EQ(result.ToString(), row.result);
-  EXPECT_EQ(result.IsInterval(), std::string_view(row.result).find(':') != std::string_view::npos);
-  EXPECT_EQ(left.ToString(), row.left);
-  EXPECT_EQ(right.ToString(), row.right);
+  SCOPED_TRACE(testing::Message() << row.fZone << ": " << row.fLeft << ' ' << row.fOperation << ' ' << row.fRight);
+  TEnvironmentGuard const zone("TZ", row.fZone);
+  TCIMDateTime const left = At(row.fLeft), right = At(row.fRight);
+  TCIMDateTime const result = row.fOperation == '+' ? left + right : left - right;
+  EXPECT_EQ(result.ToString(), row.fResult);
+  EXPECT_EQ(result.IsInterval(), std::string_view(row.fResult).find(':') != std::string_view::npos);
+  EXPECT_EQ(left.ToString(), row.fLeft);
+  EXPECT_EQ(right.ToString(), row.fRight);
 }
 
 TEST_F(TCIMDateTimeTest, AddsIntervals) {
@@ -644,7 +645,7 @@ TEST_F(TCIMDateTimeTest, AddsAnIntervalToATimestamp) {
   };
   for (TArithmeticRow const& row : rows) {
     ExpectResult(row);
-    ExpectResult({row.zone, row.right, '+', row.left, row.result});
+    ExpectResult({row.fZone, row.fRight, '+', row.fLeft, row.fResult});
   }
 }
 

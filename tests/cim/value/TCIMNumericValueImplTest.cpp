@@ -65,9 +65,9 @@ TYPED_TEST(TCIMNumericConversionTest, TheDataIsOneTagAndOneWord) {
 // ---- Text ----
 
 struct TTextRow {
-  TImpl data;
-  int radix;
-  char const* text;  // nullptr: kZEPStatusNotSupported
+  TImpl fData;
+  int fRadix;
+  char const* fText;  // nullptr: kZEPStatusNotSupported
 };
 
 TTextRow const kTexts[] = {

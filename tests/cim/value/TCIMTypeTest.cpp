@@ -9,9 +9,9 @@ namespace {
 using TType = TCIMValue::TCIMType;
 
 struct TNameRow {
-  TType::ECIMType type;
-  int number;
-  char const* name;
+  TType::ECIMType fType;
+  int fNumber;
+  char const* fName;
 };
 
 constexpr TNameRow kNames[] = {
@@ -31,11 +31,11 @@ TEST(TCIMTypeTest, TagsHaveTheirNumbers) {
   EXPECT_EQ(TType::kCIMTypeInvalid, 0);
   EXPECT_EQ(TType::kCIMTypeArrayFlag, 16);
   EXPECT_EQ(sizeof(TType), 4u);
-  for (auto const& row : kNames) EXPECT_EQ(row.type, row.number) << row.name;
+  for (auto const& row : kNames) EXPECT_EQ(row.fType, row.fNumber) << row.fName;
 }
 
 TEST(TCIMTypeTest, ANameGivesItsTag) {
-  for (auto const& row : kNames) EXPECT_EQ(TType(std::string(row.name)), row.type) << row.name;
+  for (auto const& row : kNames) EXPECT_EQ(TType(std::string(row.fName)), row.fType) << row.fName;
 }
 
 TEST(TCIMTypeTest, NamesAreMatchedWithoutRegardToCase) {
@@ -51,11 +51,11 @@ TEST(TCIMTypeTest, AnUnknownNameSetsNoTag) {
 }
 
 TEST(TCIMTypeTest, ATagPrintsItsName) {
-  for (auto const& row : kNames) EXPECT_EQ(TType(row.type).ToString(), row.name);
+  for (auto const& row : kNames) EXPECT_EQ(TType(row.fType).ToString(), row.fName);
 }
 
 TEST(TCIMTypeTest, AnArrayPrintsTheNameOfItsBaseType) {
-  for (auto const& row : kNames) EXPECT_EQ(ArrayOf(row.type).ToString(), row.name);
+  for (auto const& row : kNames) EXPECT_EQ(ArrayOf(row.fType).ToString(), row.fName);
 }
 
 TEST(TCIMTypeTest, ATagWithoutNameThrowsTypeMismatch) {

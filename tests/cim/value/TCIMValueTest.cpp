@@ -131,11 +131,11 @@ TEST(TCIMValueTest, SetNullValueDropsTheDataAndKeepsTheReferencedClass) {
 // ---- Each kind of value: its tag, its text, and what it converts to ----
 
 struct TKindRow {
-  char const* name;
-  int tag;
-  TCIMValue value;
-  std::function<void(TCIMValue&)> set;  // the setter with the same argument
-  char const* text;
+  char const* fName;
+  int fTag;
+  TCIMValue fValue;
+  std::function<void(TCIMValue&)> fSet;  // the setter with the same argument
+  char const* fText;
 };
 
 std::vector<TKindRow> Kinds() {
@@ -165,9 +165,9 @@ std::vector<TKindRow> Kinds() {
 }
 
 struct TConversionRow {
-  char const* name;
-  int tag;
-  std::function<bool(TCIMValue const&)> convert;  // whether the result is that of the row in Kinds
+  char const* fName;
+  int fTag;
+  std::function<bool(TCIMValue const&)> fConvert;  // whether the result is that of the row in Kinds
 };
 
 std::vector<TConversionRow> Conversions() {
@@ -193,33 +193,33 @@ std::vector<TConversionRow> Conversions() {
 
 TEST(TCIMValueTest, EachConstructorSetsItsTagAndItsData) {
   for (auto const& row : Kinds()) {
-    EXPECT_EQ(row.value.GetType(), row.tag) << row.name;
-    EXPECT_FALSE(row.value.IsNull()) << row.name;
-    EXPECT_EQ(row.value.ToString(), row.text) << row.name;
-    EXPECT_EQ(row.value.IsArray(), row.tag == 18) << row.name;
-    EXPECT_EQ(row.value.IsReference(), row.tag == 15) << row.name;
+    EXPECT_EQ(row.fValue.GetType(), row.fTag) << row.fName;
+    EXPECT_FALSE(row.fValue.IsNull()) << row.fName;
+    EXPECT_EQ(row.fValue.ToString(), row.fText) << row.fName;
+    EXPECT_EQ(row.fValue.IsArray(), row.fTag == 18) << row.fName;
+    EXPECT_EQ(row.fValue.IsReference(), row.fTag == 15) << row.fName;
   }
 }
 
 TEST(TCIMValueTest, EachSetterReplacesTagAndDataOfAnyOtherKind) {
   for (auto const& from : Kinds())
     for (auto const& to : Kinds()) {
-      TCIMValue value(from.value);
-      to.set(value);
-      EXPECT_EQ(value.GetType(), to.tag) << from.name << " to " << to.name;
-      EXPECT_EQ(value.ToString(), to.text) << from.name << " to " << to.name;
+      TCIMValue value(from.fValue);
+      to.fSet(value);
+      EXPECT_EQ(value.GetType(), to.fTag) << from.fName << " to " << to.fName;
+      EXPECT_EQ(value.ToString(), to.fText) << from.fName << " to " << to.fName;
     }
 }
 
 TEST(TCIMValueTest, ScalarSettersKeepReferencedClassAndSize) {
   boost::shared_ptr<ICIMClass> const cls = NewClass();
   for (auto const& row : Kinds()) {
-    if (row.tag == 15 || row.tag == 18) continue;
+    if (row.fTag == 15 || row.fTag == 18) continue;
     TCIMValue value(TType::kCIMTypeString, 4);
     value.SetReferencedClass(cls);
-    row.set(value);
-    EXPECT_EQ(value.GetReferencedClass(), cls) << row.name;
-    EXPECT_EQ(value.GetMaxArraySize(), 4u) << row.name;
+    row.fSet(value);
+    EXPECT_EQ(value.GetReferencedClass(), cls) << row.fName;
+    EXPECT_EQ(value.GetMaxArraySize(), 4u) << row.fName;
   }
 }
 
@@ -247,19 +247,19 @@ TEST(TCIMValueTest, SettersCopyTheirArgument) {
 TEST(TCIMValueTest, ConversionsAreStrict) {
   for (auto const& row : Kinds())
     for (auto const& conversion : Conversions()) {
-      SCOPED_TRACE(std::string(row.name) + " read as " + conversion.name);
-      if (row.tag == conversion.tag)
-        EXPECT_TRUE(conversion.convert(row.value));
+      SCOPED_TRACE(std::string(row.fName) + " read as " + conversion.fName);
+      if (row.fTag == conversion.fTag)
+        EXPECT_TRUE(conversion.fConvert(row.fValue));
       else
-        EXPECT_STATUS(conversion.convert(row.value), kZEPStatusTypeMismatch);
+        EXPECT_STATUS(conversion.fConvert(row.fValue), kZEPStatusTypeMismatch);
     }
 }
 
 TEST(TCIMValueTest, ConvertingANullValueOfAnyTagThrows) {
   for (auto const& row : Kinds())
     for (auto const& conversion : Conversions()) {
-      SCOPED_TRACE(std::string("NULL ") + row.name + " read as " + conversion.name);
-      EXPECT_STATUS(conversion.convert(NullOf(row.value.GetType())), kZEPStatusValueIsNULL);
+      SCOPED_TRACE(std::string("NULL ") + row.fName + " read as " + conversion.fName);
+      EXPECT_STATUS(conversion.fConvert(NullOf(row.fValue.GetType())), kZEPStatusValueIsNULL);
     }
 }
 
@@ -283,7 +283,7 @@ TEST(TCIMValueTest, ToStringPassesTheRadixOn) {
   EXPECT_EQ(TCIMValue(8u).ToString(10), "8");
   EXPECT_STATUS(TCIMValue(8u).ToString(2), kZEPStatusNotSupported);
   EXPECT_EQ(TCIMValue("a").ToString(2), "a");
-  for (auto const& row : Kinds()) EXPECT_STATUS(NullOf(row.value.GetType()).ToString(), kZEPStatusValueIsNULL);
+  for (auto const& row : Kinds()) EXPECT_STATUS(NullOf(row.fValue.GetType()).ToString(), kZEPStatusValueIsNULL);
 }
 
 TEST(TCIMValueTest, OnlyANullValueAcceptsAReferencedClass) {
@@ -293,10 +293,10 @@ TEST(TCIMValueTest, OnlyANullValueAcceptsAReferencedClass) {
   EXPECT_EQ(null.GetReferencedClass(), cls);
 
   for (auto const& row : Kinds()) {
-    TCIMValue value(row.value);
+    TCIMValue value(row.fValue);
     TState const before(value);
     EXPECT_STATUS(value.SetReferencedClass(cls), kZEPStatusInvalidOpSequence);
-    EXPECT_EQ(TState(value), before) << row.name;
+    EXPECT_EQ(TState(value), before) << row.fName;
   }
 }
 
@@ -338,9 +338,9 @@ std::string ErrorLogged() {
 }
 
 struct TWrongElementRow {
-  TType type;
-  TElements elements;
-  char const* message;
+  TType fType;
+  TElements fElements;
+  char const* fMessage;
 };
 
 TEST(TCIMValueTest, AnElementOfAnotherTypeIsLoggedAndRefused) {
@@ -360,10 +360,10 @@ TEST(TCIMValueTest, AnElementOfAnotherTypeIsLoggedAndRefused) {
   };
   OnNewThread([&] {
     for (auto const& row : rows) {
-      SCOPED_TRACE(row.message);
+      SCOPED_TRACE(row.fMessage);
       TRootObject::GetCoreLogger()->ClearLog();
-      EXPECT_STATUS(TCIMValue(row.type, 0, row.elements), kZEPStatusInvalidProperty);
-      EXPECT_EQ(ErrorLogged(), row.message);
+      EXPECT_STATUS(TCIMValue(row.fType, 0, row.fElements), kZEPStatusInvalidProperty);
+      EXPECT_EQ(ErrorLogged(), row.fMessage);
     }
     TRootObject::GetCoreLogger()->ClearLog();
   });
@@ -420,9 +420,9 @@ TEST(TCIMValueTest, AConstructionThatThrowsLeaksNothing) {
 // ---- Equality and order ----
 
 struct TCompareRow {
-  char const* what;
-  TCIMValue a, b;
-  bool equal, less;
+  char const* fWhat;
+  TCIMValue fA, fB;
+  bool fEqual, fLess;
 };
 
 TEST(TCIMValueTest, ComparesByNullThenTagThenData) {
@@ -461,14 +461,14 @@ TEST(TCIMValueTest, ComparesByNullThenTagThenData) {
        TCIMValue(TType::kCIMTypeUint8, 0, TElements()), false, false},
   };
   for (auto const& row : rows) {
-    EXPECT_EQ(row.a == row.b, row.equal) << row.what;
-    EXPECT_EQ(row.b == row.a, row.equal) << row.what;
-    EXPECT_EQ(row.a != row.b, !row.equal) << row.what;
-    if (row.equal && row.a.IsArray() && !row.a.IsNull()) continue;  // arrays have no order
-    EXPECT_EQ(row.a < row.b, row.less) << row.what;
-    EXPECT_EQ(row.a >= row.b, !row.less) << row.what;
-    EXPECT_EQ(row.a <= row.b, row.equal || row.less) << row.what;
-    EXPECT_EQ(row.a > row.b, !row.equal && !row.less) << row.what;
+    EXPECT_EQ(row.fA == row.fB, row.fEqual) << row.fWhat;
+    EXPECT_EQ(row.fB == row.fA, row.fEqual) << row.fWhat;
+    EXPECT_EQ(row.fA != row.fB, !row.fEqual) << row.fWhat;
+    if (row.fEqual && row.fA.IsArray() && !row.fA.IsNull()) continue;  // arrays have no order
+    EXPECT_EQ(row.fA < row.fB, row.fLess) << row.fWhat;
+    EXPECT_EQ(row.fA >= row.fB, !row.fLess) << row.fWhat;
+    EXPECT_EQ(row.fA <= row.fB, row.fEqual || row.fLess) << row.fWhat;
+    EXPECT_EQ(row.fA > row.fB, !row.fEqual && !row.fLess) << row.fWhat;
   }
 }
 
@@ -476,9 +476,9 @@ TEST(TCIMValueTest, EveryKindSortsByItsTag) {
   auto const kinds = Kinds();
   for (auto const& a : kinds)
     for (auto const& b : kinds) {
-      if (a.tag == b.tag) continue;
-      EXPECT_EQ(a.value < b.value, a.tag < b.tag) << a.name << " and " << b.name;
-      EXPECT_FALSE(a.value == b.value) << a.name << " and " << b.name;
+      if (a.fTag == b.fTag) continue;
+      EXPECT_EQ(a.fValue < b.fValue, a.fTag < b.fTag) << a.fName << " and " << b.fName;
+      EXPECT_FALSE(a.fValue == b.fValue) << a.fName << " and " << b.fName;
     }
 }
 
@@ -528,8 +528,8 @@ TCIMValue Transferred(EWay way, TCIMValue source) {
 TEST(TCIMValueTest, EveryKindIsCopiedAndMoved) {
   for (auto const& [way, name] : kWays)
     for (auto const& row : Kinds()) {
-      SCOPED_TRACE(std::string(row.name) + " by " + name);
-      EXPECT_EQ(TState(Transferred(way, row.value)), TState(row.value));
+      SCOPED_TRACE(std::string(row.fName) + " by " + name);
+      EXPECT_EQ(TState(Transferred(way, row.fValue)), TState(row.fValue));
     }
 }
 
@@ -549,10 +549,10 @@ TEST(TCIMValueTest, CopyingANullOfTagZeroMakesTheDestinationNullWithoutAThrow) {
     EXPECT_EQ(TState(Transferred(way, TCIMValue())), TState(TCIMValue()));
     if (way == EWay::kConstruct || way == EWay::kMoveConstruct) continue;
     for (auto const& row : Kinds()) {
-      TCIMValue value(row.value);
+      TCIMValue value(row.fValue);
       Transfer(way, value, TCIMValue());
-      EXPECT_TRUE(value.IsNull()) << row.name;
-      EXPECT_EQ(value.GetType(), TType::kCIMTypeInvalid) << row.name;
+      EXPECT_TRUE(value.IsNull()) << row.fName;
+      EXPECT_EQ(value.GetType(), TType::kCIMTypeInvalid) << row.fName;
     }
   }
 }
@@ -640,12 +640,12 @@ TEST(TCIMValueTest, AssignmentThrowsWhatEqualityThrows) {
 
 TEST(TCIMValueTest, AssignmentFromItselfKeepsTheValue) {
   for (auto const& row : Kinds()) {
-    TCIMValue value(row.value);
+    TCIMValue value(row.fValue);
     TCIMValue& itself = value;
     value = itself;
     value.Set(itself);
     value = std::move(itself);
-    EXPECT_EQ(TState(value), TState(row.value)) << row.name;
+    EXPECT_EQ(TState(value), TState(row.fValue)) << row.fName;
   }
   // A NaN is not equal to itself, so assignment copies it.
   TCIMValue nan(kNaN);
@@ -693,14 +693,14 @@ TEST(TCIMValueTest, AReferenceMayBeMovedFromAnElement) {
 
 TEST(TCIMValueTest, AMovedValueIsInTheDefaultState) {
   for (auto const& row : Kinds()) {
-    TCIMValue from(row.value);
+    TCIMValue from(row.fValue);
     TCIMValue const constructed(std::move(from));
-    EXPECT_EQ(TState(from), TState(TCIMValue())) << row.name;
+    EXPECT_EQ(TState(from), TState(TCIMValue())) << row.fName;
 
-    from = row.value;
+    from = row.fValue;
     TCIMValue assigned;
     assigned = std::move(from);
-    EXPECT_EQ(TState(from), TState(TCIMValue())) << row.name;
+    EXPECT_EQ(TState(from), TState(TCIMValue())) << row.fName;
   }
 }
 

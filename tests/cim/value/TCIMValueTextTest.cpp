@@ -21,9 +21,9 @@ TCIMValue Parse(TType type, std::string text, boost::shared_ptr<ICIMNamespace> n
 // ---- Numbers and booleans ----
 
 struct TReadRow {
-  TType::ECIMType type;
-  char const* text;
-  char const* printed;
+  TType::ECIMType fType;
+  char const* fText;
+  char const* fPrinted;
 };
 
 constexpr TReadRow kReads[] = {
@@ -144,9 +144,9 @@ constexpr TReadRow kReads[] = {
 
 TEST(TCIMValueTextTest, NumbersAndBooleansAreReadAsAStreamReadsThem) {
   for (auto const& row : kReads) {
-    TCIMValue const value = Parse(row.type, row.text);
-    EXPECT_EQ(value.GetType(), row.type) << row.text;
-    EXPECT_EQ(value.ToString(), row.printed) << TType(row.type) << " '" << row.text << "'";
+    TCIMValue const value = Parse(row.fType, row.fText);
+    EXPECT_EQ(value.GetType(), row.fType) << row.fText;
+    EXPECT_EQ(value.ToString(), row.fPrinted) << TType(row.fType) << " '" << row.fText << "'";
   }
 }
 

@@ -32,9 +32,9 @@ TStandInIpmiClient* StandInIpmiClient() { return &gStandIn; }
 #ifndef STANDIN_WITHOUT_OPEN
 int OpenConnection(int mode, char const* host, char const* port, char const* user, char const* password) {
   Record("OpenConnection(" + std::to_string(mode) + ", " + host + ", " + port + ", " + user + ", " + password + ")");
-  if (gStandIn.atOpen) gStandIn.atOpen();
-  if (gStandIn.thrownByOpen != 0) throw gStandIn.thrownByOpen;
-  return gStandIn.openResult;
+  if (gStandIn.fAtOpen) gStandIn.fAtOpen();
+  if (gStandIn.fThrownByOpen != 0) throw gStandIn.fThrownByOpen;
+  return gStandIn.fOpenResult;
 }
 #endif
 
@@ -47,11 +47,11 @@ int SendIpmiCommand(unsigned char command, unsigned char const* request, int req
   Record("SendIpmiCommand(" + Hex(command) + "," + bytes + ", " + std::to_string(requestLength) + ", " +
          (isCleared ? "cleared" : "used") + " buffer, " + std::to_string(*responseLength) + ", " + Hex(*completionCode) + ", " +
          Hex(netFn) + ")");
-  std::copy(gStandIn.response.begin(), gStandIn.response.end(), response);
-  *responseLength = static_cast<unsigned short>(gStandIn.responseLength < 0 ? static_cast<int>(gStandIn.response.size())
-                                                                            : gStandIn.responseLength);
+  std::copy(gStandIn.fResponse.begin(), gStandIn.fResponse.end(), response);
+  *responseLength = static_cast<unsigned short>(gStandIn.fResponseLength < 0 ? static_cast<int>(gStandIn.fResponse.size())
+                                                                             : gStandIn.fResponseLength);
   *completionCode = 0;
-  return gStandIn.sendResult;
+  return gStandIn.fSendResult;
 }
 #endif
 

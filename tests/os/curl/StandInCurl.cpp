@@ -26,7 +26,7 @@ void* gWriteContext = nullptr;
 int gHandle;
 
 void Note(std::string const& call) {
-  if (gRecord != nullptr) gRecord->calls.push_back(call);
+  if (gRecord != nullptr) gRecord->fCalls.push_back(call);
 }
 
 long SizeOf(std::string const& path) {
@@ -64,9 +64,9 @@ std::string TextOf(int option, std::va_list& arguments) {
 
 // False when one was refused.
 bool WriteChunks() {
-  for (std::string& chunk : gRecord->chunks) {
+  for (std::string& chunk : gRecord->fChunks) {
     unsigned long const written = gWrite(chunk.data(), 1, chunk.size(), gWriteContext);
-    std::string const& file = gRecord->fileToWatch;
+    std::string const& file = gRecord->fFileToWatch;
     Note("write " + std::to_string(written) + (file.empty() ? "" : " file " + std::to_string(SizeOf(file))));
     if (written != chunk.size()) return false;
   }
@@ -75,7 +75,7 @@ bool WriteChunks() {
 
 void ReadUpload() {
   char chunk[1000];
-  while (std::size_t const got = std::fread(chunk, 1, sizeof chunk, gUpload)) gRecord->uploaded.append(chunk, got);
+  while (std::size_t const got = std::fread(chunk, 1, sizeof chunk, gUpload)) gRecord->fUploaded.append(chunk, got);
 }
 
 // When the library goes, which is when the last who opened it closes it.
@@ -104,7 +104,7 @@ CURLcode curl_global_init(long flags) {
 
 CURL* curl_easy_init() {
   Note("easy_init");
-  return gRecord != nullptr && gRecord->givesNoHandle ? nullptr : &gHandle;
+  return gRecord != nullptr && gRecord->fGivesNoHandle ? nullptr : &gHandle;
 }
 
 // In brackets, because it is a macro as well.
@@ -118,17 +118,17 @@ CURLcode(curl_easy_setopt)(CURL* handle, CURLoption option, ...) {
     Note(std::string("setopt ") + name->second + " " + TextOf(option, arguments));
   }
   va_end(arguments);
-  return gRecord != nullptr && gRecord->refusedOption == option ? CURLE_UNKNOWN_OPTION : CURLE_OK;
+  return gRecord != nullptr && gRecord->fRefusedOption == option ? CURLE_UNKNOWN_OPTION : CURLE_OK;
 }
 
 CURLcode curl_easy_perform(CURL* handle) {
   Note(handle == &gHandle ? "perform" : "perform of a strange handle");
   if (gRecord == nullptr) return CURLE_OK;
-  gRecord->errorTextAtStart = gErrorBuffer;
+  gRecord->fErrorTextAtStart = gErrorBuffer;
   if (gUpload != nullptr) ReadUpload();
   if (gWrite != nullptr && !WriteChunks()) return CURLE_WRITE_ERROR;
-  if (!gRecord->errorText.empty()) std::strcpy(gErrorBuffer, gRecord->errorText.c_str());
-  return static_cast<CURLcode>(gRecord->result);
+  if (!gRecord->fErrorText.empty()) std::strcpy(gErrorBuffer, gRecord->fErrorText.c_str());
+  return static_cast<CURLcode>(gRecord->fResult);
 }
 
 void curl_easy_cleanup(CURL* handle) { Note(handle == &gHandle ? "easy_cleanup" : "easy_cleanup of a strange handle"); }

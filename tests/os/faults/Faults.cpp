@@ -35,11 +35,11 @@ constexpr int kFunctions = 64;
 // Shared with children, whose calls are counted as well.
 struct TState {
   struct {
-    char name[32];
-    int calls;
-  } functions[kFunctions];
-  bool armed;
-  bool fired;
+    char fName[32];
+    int fCalls;
+  } fFunctions[kFunctions];
+  bool fArmed;
+  bool fFired;
 };
 
 TState* gState = nullptr;
@@ -55,20 +55,20 @@ __attribute__((constructor)) void Prepare() {
 
 // How often the function was called by now, this call included.
 int Count(char const* name) {
-  for (auto& function : gState->functions) {
-    if (function.name[0] == '\0') ::strcpy(function.name, name);
-    if (::strcmp(function.name, name) == 0) return ++function.calls;
+  for (auto& function : gState->fFunctions) {
+    if (function.fName[0] == '\0') ::strcpy(function.fName, name);
+    if (::strcmp(function.fName, name) == 0) return ++function.fCalls;
   }
   ::abort();
 }
 
 bool IsTheOne(char const* function) {
-  if (gState == nullptr || !gState->armed) return false;
+  if (gState == nullptr || !gState->fArmed) return false;
   char name[32] = "";
   if (::getpid() != gProcess) ::strcpy(name, "child.");
   ::strcat(name, function);
   if (Count(name) != gNumber || ::strcmp(name, gFault) != 0) return false;
-  gState->fired = true;
+  gState->fFired = true;
   return true;
 }
 
@@ -188,17 +188,17 @@ EXPORT pid_t vfork() {
 
 EXPORT void ArmFaults() {
   gProcess = ::getpid();
-  gState->armed = true;
+  gState->fArmed = true;
 }
 
 EXPORT bool DisarmFaults() {
-  gState->armed = false;
-  return gState->fired;
+  gState->fArmed = false;
+  return gState->fFired;
 }
 
 EXPORT char const* CallsOfFaults() {
   static char text[4096];
-  for (auto const& function : gState->functions)
-    if (function.name[0] != '\0') ::sprintf(text + ::strlen(text), "%s %d\n", function.name, function.calls);
+  for (auto const& function : gState->fFunctions)
+    if (function.fName[0] != '\0') ::sprintf(text + ::strlen(text), "%s %d\n", function.fName, function.fCalls);
   return text;
 }

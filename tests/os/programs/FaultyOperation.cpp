@@ -118,7 +118,7 @@ TCurlRecord gCurl;
 void UseStandInCurl() {
   void* const library = ::dlopen(ZEP_CURL_DIR "/whole/libcurl.so", RTLD_LAZY);  // is "libcurl.so" from now on
   reinterpret_cast<TUseRecord*>(::dlsym(library, "StandInUse"))(&gCurl);
-  gCurl.chunks = {"first ", "second"};
+  gCurl.fChunks = {"first ", "second"};
 }
 
 std::string Transfer(std::string const& file, bool download) {
@@ -156,9 +156,9 @@ std::map<std::string, TOperation> const kOperations = {
     {"GetKeyboardChar", {[] { return std::to_string(TOSSpecific::GetKeyboardChar()); }, [] { return ""; }, [] { Type("k\n"); }}},
     {"USleep", {[] { return std::to_string(TOSSpecific::USleep(1)); }}},
     {"LaunchCommandShell", {[] { return std::to_string(TOSSpecific::LaunchCommandShell()); }}},
-    {"Upload", {[] { return Transfer("small", false); }, [] { return gCurl.uploaded; }, UseStandInCurl}},
+    {"Upload", {[] { return Transfer("small", false); }, [] { return gCurl.fUploaded; }, UseStandInCurl}},
     {"UploadOfSeveralReads",
-     {[] { return Transfer("large", false); }, [] { return std::to_string(gCurl.uploaded.size()) + " bytes"; }, UseStandInCurl}},
+     {[] { return Transfer("large", false); }, [] { return std::to_string(gCurl.fUploaded.size()) + " bytes"; }, UseStandInCurl}},
     {"Download", {[] { return Transfer("new", true); }, [] { return ReadFile("new"); }, UseStandInCurl}},
     {"TConfig", {[] { return Joined(TConfig::GetInstance()->listKeys()); }}},
     {"TConfigOfSeveralReads",

@@ -83,9 +83,9 @@ TEST(SmbiosTableTest, AReaderWithoutATableIsAtTheEnd) {
 TEST(SmbiosTableTest, DamagedTablesEndBeforeTheDamage) {
   std::string const good = Structure(0, "xy", {"ok"});
   struct TRow {
-    char const* what;
-    std::string table;
-    std::vector<int> types;
+    char const* fWhat;
+    std::string fTable;
+    std::vector<int> fTypes;
   };
   TRow const rows[] = {
       {"empty", "", {}},
@@ -113,8 +113,8 @@ TEST(SmbiosTableTest, DamagedTablesEndBeforeTheDamage) {
       {"type 127 first", EndOfTable() + good, {127}},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
-    EXPECT_EQ(TypesIn(row.table), row.types);
+    SCOPED_TRACE(row.fWhat);
+    EXPECT_EQ(TypesIn(row.fTable), row.fTypes);
   }
 }
 
@@ -177,9 +177,9 @@ TEST(SmbiosTableTest, ABareTableIsTheWholeFile) {
 TEST(SmbiosTableTest, AnEntryPointRefersToTheTable) {
   std::string const table = RealTable("full");
   struct TRow {
-    char const* what;
-    std::string file;
-    std::string table;
+    char const* fWhat;
+    std::string fFile;
+    std::string fTable;
   };
   TRow const rows[] = {
       {"32 bits", EntryPoint32(table.size()) + table, table},
@@ -196,8 +196,8 @@ TEST(SmbiosTableTest, AnEntryPointRefersToTheTable) {
       {"64 bits, the largest possible size", EntryPoint64(0xFFFFFFFF) + table, table},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
-    EXPECT_EQ(DmiTableIn(row.file), row.table);
+    SCOPED_TRACE(row.fWhat);
+    EXPECT_EQ(DmiTableIn(row.fFile), row.fTable);
   }
 }
 
@@ -210,8 +210,8 @@ TEST(SmbiosTableTest, AnInvalidEntryPointHasNoTable) {
     return file;
   };
   struct TRow {
-    char const* what;
-    std::string file;
+    char const* fWhat;
+    std::string fFile;
   };
   std::string const wrongInnerAnchor = WithCheckSum(WithCheckSum(with(sound32, 0x10, '-'), 0x15, 0x10, 0x0F), 4, 0, 0x1F);
   std::string const wrongInnerChecksum = WithCheckSum(with(sound32, 0x1E, 9), 4, 0, 0x1F);
@@ -242,8 +242,8 @@ TEST(SmbiosTableTest, AnInvalidEntryPointHasNoTable) {
       {"64 bits: size 0", EntryPoint64(0) + table},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
-    EXPECT_TRUE(DmiTableIn(row.file).empty());
+    SCOPED_TRACE(row.fWhat);
+    EXPECT_TRUE(DmiTableIn(row.fFile).empty());
   }
 }
 

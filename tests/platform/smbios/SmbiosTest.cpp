@@ -105,8 +105,8 @@ TEST_F(SmbiosLibraryTest, NeedsNothingOfTheCore) {
 
 TEST_F(SmbiosLibraryTest, ReadsRealTables) {
   struct TRow {
-    char const* name;
-    std::string product, serial, bios;
+    char const* fName;
+    std::string fProduct, fSerial, fBios;
   };
   TRow const rows[] = {
       {"full", "Server Q100 -[1234AB7]-", "KQ12345", "-[ABE123CUS-1.10]-"},
@@ -118,13 +118,13 @@ TEST_F(SmbiosLibraryTest, ReadsRealTables) {
       {"entry64", "Server Q100 -[1234AB7]-", "KQ12345", "-[ABE123CUS-1.10]-"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.name);
-    THandle const handle = Open(RealTable(row.name));
+    SCOPED_TRACE(row.fName);
+    THandle const handle = Open(RealTable(row.fName));
     std::string const bios = First(handle, 0);
     std::string const system = First(handle, 1);
-    EXPECT_NE(bios.find(row.bios + "\0\0"s), bios.npos) << "the last string, followed by the double zero";
-    EXPECT_NE(system.find("\0"s + row.product + "\0"s), system.npos);
-    EXPECT_NE(system.find("\0"s + row.serial + "\0\0"s), system.npos);
+    EXPECT_NE(bios.find(row.fBios + "\0\0"s), bios.npos) << "the last string, followed by the double zero";
+    EXPECT_NE(system.find("\0"s + row.fProduct + "\0"s), system.npos);
+    EXPECT_NE(system.find("\0"s + row.fSerial + "\0\0"s), system.npos);
   }
 }
 
@@ -139,9 +139,9 @@ TEST_F(SmbiosLibraryTest, ReadsDumpsWithEntryPointsOfAllForms) {
 TEST_F(SmbiosLibraryTest, EachFailureOfLoadHasItsStatus) {
   std::string const table = RealTable("full");
   struct TRow {
-    char const* what;
-    std::string contents;
-    int status;
+    char const* fWhat;
+    std::string fContents;
+    int fStatus;
   };
   TRow const rows[] = {
       {"a table", table, kSmbiosOk},
@@ -152,8 +152,8 @@ TEST_F(SmbiosLibraryTest, EachFailureOfLoadHasItsStatus) {
       {"an entry point and no table", EntryPoint32(100), kSmbiosFail},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
-    EXPECT_EQ(LoadStatus(row.contents), row.status);
+    SCOPED_TRACE(row.fWhat);
+    EXPECT_EQ(LoadStatus(row.fContents), row.fStatus);
   }
   EXPECT_EQ(LoadStatusOfPath(fDir.Path("absent")), kSmbiosFileNotFound);
   EXPECT_EQ(LoadStatusOfPath(fDir.Path("table/below a file")), kSmbiosFileNotFound);

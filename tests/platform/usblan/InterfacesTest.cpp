@@ -30,10 +30,10 @@ TEST(UsbLanAddressTest, EachNodeHasANetworkOfItsOwn) {
 
 TEST(UsbLanAddressTest, AnInterfaceReachesTheControllerOfItsNetworkWhileItIsUp) {
   struct TRow {
-    char const* what;
-    TInterface interface;
-    int node;
-    bool reaches;
+    char const* fWhat;
+    TInterface fInterface;
+    int fNode;
+    bool fReaches;
   };
   TRow const rows[] = {
       {"no address", {"usb0", true}, 0, false},
@@ -48,7 +48,7 @@ TEST(UsbLanAddressTest, AnInterfaceReachesTheControllerOfItsNetworkWhileItIsUp) 
       {"a host address", {"usb0", true, {{Ip(169, 254, 95, 1), 0xFFFFFFFF}}}, 0, false},
       {"a network of everything", {"usb0", true, {{Ip(10, 0, 0, 1), 0}}}, 0, false},
   };
-  for (TRow const& row : rows) EXPECT_EQ(Reaches(row.interface, row.node), row.reaches) << row.what;
+  for (TRow const& row : rows) EXPECT_EQ(Reaches(row.fInterface, row.fNode), row.fReaches) << row.fWhat;
 }
 
 // The kernel's files in /sys/class/net.
@@ -61,7 +61,7 @@ protected:
 
   std::vector<std::string> Found(std::vector<TInterface> const& all, std::string const& named = "") {
     std::vector<std::string> names;
-    for (TInterface const& interface : ControllerInterfaces(all, named, fDir.Path())) names.push_back(interface.name);
+    for (TInterface const& interface : ControllerInterfaces(all, named, fDir.Path())) names.push_back(interface.fName);
     return names;
   }
 
@@ -99,17 +99,17 @@ TEST_F(ControllerInterfacesTest, NamedOnesCountInTheirOrder) {
 TEST_F(ControllerInterfacesTest, ANamedOneThatIsMissingKeepsItsPlace) {
   std::vector<TInterface> const nodes = ControllerInterfaces({{"veth0"}, {"veth1"}}, "absent veth1 gone veth0", fDir.Path());
   ASSERT_EQ(nodes.size(), 4u);
-  for (std::size_t node : {0, 2}) EXPECT_FALSE(nodes[node].isThere) << node;
-  EXPECT_EQ(nodes[1].name, "veth1");
-  EXPECT_TRUE(nodes[1].isThere);
-  EXPECT_EQ(nodes[3].name, "veth0");
+  for (std::size_t node : {0, 2}) EXPECT_FALSE(nodes[node].fIsThere) << node;
+  EXPECT_EQ(nodes[1].fName, "veth1");
+  EXPECT_TRUE(nodes[1].fIsThere);
+  EXPECT_EQ(nodes[3].fName, "veth0");
 }
 
 TEST_F(ControllerInterfacesTest, ThereAreNoMoreThan16) {
   std::vector<TInterface> all;
   for (int n = 10; n < 30; ++n) {
     all.push_back({"usb" + std::to_string(n)});
-    AddInterface(all.back().name, "cdc_ether");
+    AddInterface(all.back().fName, "cdc_ether");
   }
   std::vector<std::string> const found = Found(all);
   EXPECT_EQ(found.size(), 16u);
@@ -118,7 +118,7 @@ TEST_F(ControllerInterfacesTest, ThereAreNoMoreThan16) {
 
 TEST(AllInterfacesTest, LoopbackIsAmongThem) {
   std::vector<TInterface> const all = AllInterfaces();
-  auto const isLoopback = [](TInterface const& interface) { return interface.name == "lo"; };
+  auto const isLoopback = [](TInterface const& interface) { return interface.fName == "lo"; };
   EXPECT_EQ(std::count_if(all.begin(), all.end(), isLoopback), 1);
 }
 

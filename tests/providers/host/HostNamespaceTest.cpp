@@ -93,7 +93,7 @@ std::string ResultOf(std::function<std::string()> const& query) {
 
 TEST_F(HostNamespaceTest, TheSchemaHelperReadsTheRealTables) {
   struct TRow {
-    char const *table, *product, *mtm, *serial;
+    char const *fTable, *fProduct, *fMtm, *fSerial;
   } const rows[] = {
       {"full", "Server Q100 -[1234AB7]-", "1234AB7", "KQ12345"},
       {"bare7", "1234AB7", "1234AB7", "KQ12345"},
@@ -104,11 +104,11 @@ TEST_F(HostNamespaceTest, TheSchemaHelperReadsTheRealTables) {
       {"entry64", "Server Q100 -[1234AB7]-", "1234AB7", "KQ12345"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.table);
-    FillFromFile(RealTablePath(row.table));
-    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetSystemProductName(fNs); }), row.product);
-    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetMTM(fNs); }), row.mtm);
-    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetSerialNumber(fNs, TCIMContext()); }), row.serial);
+    SCOPED_TRACE(row.fTable);
+    FillFromFile(RealTablePath(row.fTable));
+    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetSystemProductName(fNs); }), row.fProduct);
+    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetMTM(fNs); }), row.fMtm);
+    EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetSerialNumber(fNs, TCIMContext()); }), row.fSerial);
     EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetSystemName(fNs); }), "db1");
     EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetDataSourceVersion(fNs, TCIMContext()); }), TEST_VERSION);
     EXPECT_EQ(ResultOf([&] { return TCIMSchemaHelper::GetDataSourceBuild(fNs, TCIMContext()); }), TEST_BUILD_ID);

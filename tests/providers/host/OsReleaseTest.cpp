@@ -26,8 +26,8 @@ ID=debian
 
 TEST(OsReleaseTest, AssignmentsAreReadAsByAShell) {
   struct TRow {
-    char const* line;
-    char const* value;
+    char const* fLine;
+    char const* fValue;
   } const rows[] = {
       {"A=word", "word"},
       {"A=\"two words\"", "two words"},
@@ -44,9 +44,9 @@ TEST(OsReleaseTest, AssignmentsAreReadAsByAShell) {
       {"A=\"ends in \\", "ends in \\"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.line);
-    EXPECT_THAT(ParseOsRelease(row.line), ElementsAre(Pair("A", row.value)));
-    EXPECT_THAT(ParseOsRelease(std::string("\n# comment\n") + row.line + "\n\n"), ElementsAre(Pair("A", row.value)));
+    SCOPED_TRACE(row.fLine);
+    EXPECT_THAT(ParseOsRelease(row.fLine), ElementsAre(Pair("A", row.fValue)));
+    EXPECT_THAT(ParseOsRelease(std::string("\n# comment\n") + row.fLine + "\n\n"), ElementsAre(Pair("A", row.fValue)));
   }
 }
 
@@ -92,8 +92,8 @@ TEST(OsReleaseTest, TheOperatingSystemIsDescribedByItsFileAndItsKernel) {
   EXPECT_EQ(record.GetClassName(), "QRVSG_OperatingSystem");
 
   struct TRow {
-    char const *name, *value, *source;
-    bool isKey;
+    char const *fName, *fValue, *fSource;
+    bool fIsKey;
   } const rows[] = {
       {"CSCreationClassName", "string QRVSG_ComputerSystem", "", true},
       {"CSName", "string db1", "", true},
@@ -108,12 +108,12 @@ TEST(OsReleaseTest, TheOperatingSystemIsDescribedByItsFileAndItsKernel) {
   };
   ASSERT_EQ(record.GetProperties().size(), std::size(rows));
   for (std::size_t at = 0; at < std::size(rows); ++at) {
-    SCOPED_TRACE(rows[at].name);
+    SCOPED_TRACE(rows[at].fName);
     TRecordProperty const& property = record.GetProperties()[at];
-    EXPECT_EQ(property.fName, rows[at].name);
-    EXPECT_EQ(PropertyOf(record, rows[at].name), rows[at].value);
-    EXPECT_EQ(property.fSource, rows[at].source);
-    EXPECT_EQ(property.fIsKey, rows[at].isKey);
+    EXPECT_EQ(property.fName, rows[at].fName);
+    EXPECT_EQ(PropertyOf(record, rows[at].fName), rows[at].fValue);
+    EXPECT_EQ(property.fSource, rows[at].fSource);
+    EXPECT_EQ(property.fIsKey, rows[at].fIsKey);
   }
 }
 

@@ -49,7 +49,7 @@ TEST_F(ScsiRecordsTest, HostsAndTargetsAreNotDevices) {
 
 TEST_F(ScsiRecordsTest, EveryTypeHasItsName) {
   struct TRow {
-    char const *type, *name;
+    char const *fType, *fName;
   };
   TRow const rows[] = {
       {"0", "Direct Access Device"},
@@ -75,8 +75,8 @@ TEST_F(ScsiRecordsTest, EveryTypeHasItsName) {
       {"-1", "<\"-1\" is not a SCSI device type>"},
   };
   for (TRow const& row : rows) {
-    fDevices.Add("0:0:0:0", row.type, "V", "M", "R");
-    EXPECT_THAT(Records(), ElementsAre(std::string("0:0:0:0|") + row.name + "|V|M|R")) << row.type;
+    fDevices.Add("0:0:0:0", row.fType, "V", "M", "R");
+    EXPECT_THAT(Records(), ElementsAre(std::string("0:0:0:0|") + row.fName + "|V|M|R")) << row.fType;
   }
 }
 

@@ -14,16 +14,16 @@ constexpr char const* kUnknown = "NULL not-given: the firmware reports it as unk
 constexpr char const* kNoText = "NULL not-given: not given by the firmware";
 
 struct TExpected {
-  char const* property;
-  std::string value;
+  char const* fProperty;
+  std::string fValue;
 };
 
 // Every property of the record, in order.
 void ExpectProperties(TRecord const& record, std::vector<TExpected> const& expected) {
   ASSERT_EQ(record.GetProperties().size(), expected.size());
   for (std::size_t at = 0; at < expected.size(); ++at) {
-    EXPECT_EQ(record.GetProperties()[at].fName, expected[at].property);
-    EXPECT_EQ(PropertyOf(record, expected[at].property), expected[at].value) << expected[at].property;
+    EXPECT_EQ(record.GetProperties()[at].fName, expected[at].fProperty);
+    EXPECT_EQ(PropertyOf(record, expected[at].fProperty), expected[at].fValue) << expected[at].fProperty;
   }
 }
 
@@ -149,16 +149,16 @@ TEST(BiosRecordTest, UefiHasNoLoadAddresses) {
 
 TEST(BiosRecordTest, DatesAreReadInBothForms) {
   struct TRow {
-    char const *text, *value;
+    char const *fText, *fValue;
   } const rows[] = {
       {"01/01/1999", "19990101000000.000000+000"}, {"12/31/2031", "20311231000000.000000+000"},
       {"02/29/2024", "20240229000000.000000+000"}, {"02/29/2000", "20000229000000.000000+000"},
       {"04/30/98", "19980430000000.000000+000"},
   };
   for (TRow const& row : rows)
-    EXPECT_EQ(PropertyOf(BiosRecord(Bios().Text(0x08, row.text).Make(), "", 0), "ReleaseDate"),
-              std::string("datetime ") + row.value)
-        << row.text;
+    EXPECT_EQ(PropertyOf(BiosRecord(Bios().Text(0x08, row.fText).Make(), "", 0), "ReleaseDate"),
+              std::string("datetime ") + row.fValue)
+        << row.fText;
 }
 
 TEST(BiosRecordTest, AnInvalidDateHasAReason) {
@@ -204,8 +204,8 @@ TEST(ChassisRecordTest, EveryFieldIsReadAtItsOffset) {
 
 TEST(ChassisRecordTest, TypesHaveTheNumbersAndNamesOfCim) {
   struct TRow {
-    int type;
-    char const *number, *name, *lock;
+    int fType;
+    char const *fNumber, *fName, *fLock;
   } const rows[] = {
       {1, "uint16 1", "string Other", "boolean false"},
       {3, "uint16 3", "string Desktop", "boolean false"},
@@ -218,11 +218,11 @@ TEST(ChassisRecordTest, TypesHaveTheNumbersAndNamesOfCim) {
       {36, "uint16 36", "string Stick PC", "boolean false"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.type);
-    TRecord const record = ChassisRecord(Chassis().Byte(0x05, row.type).Make(), "", 0);
-    EXPECT_EQ(PropertyOf(record, "ChassisPackageType"), row.number);
-    EXPECT_EQ(PropertyOf(record, "ChassisTypeDescription"), row.name);
-    EXPECT_EQ(PropertyOf(record, "LockPresent"), row.lock);
+    SCOPED_TRACE(row.fType);
+    TRecord const record = ChassisRecord(Chassis().Byte(0x05, row.fType).Make(), "", 0);
+    EXPECT_EQ(PropertyOf(record, "ChassisPackageType"), row.fNumber);
+    EXPECT_EQ(PropertyOf(record, "ChassisTypeDescription"), row.fName);
+    EXPECT_EQ(PropertyOf(record, "LockPresent"), row.fLock);
   }
 }
 
@@ -304,9 +304,9 @@ TEST(ProcessorRecordTest, FieldsThatAreUnknownToTheFirmwareAreNull) {
 
 TEST(ProcessorRecordTest, NarrowFieldsMayReferToWideFields) {
   struct TRow {
-    char const* description;
-    TStructureMaker maker;
-    char const *property, *value;
+    char const* fDescription;
+    TStructureMaker fMaker;
+    char const *fProperty, *fValue;
   } const rows[] = {
       {"family 254 names the second field", Processor().Byte(0x06, 0xfe).Word(0x28, 0x0101), "Family", "uint16 257"},
       {"family below 254 is itself", Processor().Byte(0x06, 0xfd).Word(0x28, 0x0101), "Family", "uint16 253"},
@@ -317,7 +317,8 @@ TEST(ProcessorRecordTest, NarrowFieldsMayReferToWideFields) {
       {"the last socket of CIM", Processor().Byte(0x19, 56), "UpgradeMethod", "uint16 56"},
       {"a 32-bit processor", Processor().Word(0x26, 0x0008), "DataWidth", "uint16 32"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(PropertyOf(ProcessorRecordOf(row.maker), row.property), row.value) << row.description;
+  for (TRow const& row : rows)
+    EXPECT_EQ(PropertyOf(ProcessorRecordOf(row.fMaker), row.fProperty), row.fValue) << row.fDescription;
 }
 
 TEST(ProcessorRecordTest, FieldsOfNewerVersionsAreMissingInOldStructures) {
@@ -388,9 +389,9 @@ TEST(MemoryRecordTest, EveryFieldIsReadAtItsOffset) {
 
 TEST(MemoryRecordTest, CapacityIsConvertedToBytes) {
   struct TRow {
-    char const* description;
-    TStructureMaker maker;
-    std::string value;
+    char const* fDescription;
+    TStructureMaker fMaker;
+    std::string fValue;
   } const rows[] = {
       {"megabytes", Module().Word(0x0c, 512), "536870912"},
       {"kilobytes", Module().Word(0x0c, 0x8000 | 512), "524288"},
@@ -401,14 +402,14 @@ TEST(MemoryRecordTest, CapacityIsConvertedToBytes) {
       {"extended, but the structure is short", TStructureMaker(17, 0x1c).Word(0x0c, 0x7fff), kTooShort},
       {"no field at all", TStructureMaker(17, 0x0c), kTooShort},
   };
-  for (TRow const& row : rows) EXPECT_EQ(ModuleProperty(row.maker, "Capacity"), "uint64 " + row.value) << row.description;
+  for (TRow const& row : rows) EXPECT_EQ(ModuleProperty(row.fMaker, "Capacity"), "uint64 " + row.fValue) << row.fDescription;
 }
 
 TEST(MemoryRecordTest, GreatSpeedsAreReadFromTheExtendedField) {
   struct TRow {
-    char const* description;
-    TStructureMaker maker;
-    std::string speed, configured;
+    char const* fDescription;
+    TStructureMaker fMaker;
+    std::string fSpeed, fConfigured;
   } const rows[] = {
       {"as they are", Module().Word(0x15, 3200).Word(0x20, 2933), "3200", "2933"},
       {"unknown", Module(), kUnknown, kUnknown},
@@ -419,27 +420,27 @@ TEST(MemoryRecordTest, GreatSpeedsAreReadFromTheExtendedField) {
        kTooShort},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.description);
-    EXPECT_EQ(ModuleProperty(row.maker, "MaxMemorySpeed"), "uint32 " + row.speed);
-    EXPECT_EQ(ModuleProperty(row.maker, "ConfiguredMemoryClockSpeed"), "uint32 " + row.configured);
-    bool const isKnown = row.speed.find("NULL") == std::string::npos;
-    EXPECT_EQ(ModuleProperty(row.maker, "IsSpeedInMhz"), isKnown ? "boolean true" : "boolean false");
+    SCOPED_TRACE(row.fDescription);
+    EXPECT_EQ(ModuleProperty(row.fMaker, "MaxMemorySpeed"), "uint32 " + row.fSpeed);
+    EXPECT_EQ(ModuleProperty(row.fMaker, "ConfiguredMemoryClockSpeed"), "uint32 " + row.fConfigured);
+    bool const isKnown = row.fSpeed.find("NULL") == std::string::npos;
+    EXPECT_EQ(ModuleProperty(row.fMaker, "IsSpeedInMhz"), isKnown ? "boolean true" : "boolean false");
   }
 }
 
 TEST(MemoryRecordTest, KindsHaveTheNumbersOfCim) {
   struct TRow {
-    int smbios;
-    std::string cim;
+    int fSmbios;
+    std::string fCim;
   };
   TRow const types[] = {{0x01, "1"},  {0x03, "2"},  {0x0f, "17"}, {0x12, "20"}, {0x13, "21"},     {0x14, "23"},    {0x18, "24"},
                         {0x1a, "26"}, {0x1e, "30"}, {0x22, "1"},  {0xff, "1"},  {0x02, kUnknown}, {0x00, kUnknown}};
   for (TRow const& row : types)
-    EXPECT_EQ(ModuleProperty(Module().Byte(0x12, row.smbios), "MemoryType"), "uint16 " + row.cim) << row.smbios;
+    EXPECT_EQ(ModuleProperty(Module().Byte(0x12, row.fSmbios), "MemoryType"), "uint16 " + row.fCim) << row.fSmbios;
   TRow const formFactors[] = {{0x01, "1"}, {0x03, "7"},  {0x04, "2"},  {0x06, "3"},  {0x07, "4"}, {0x08, "6"}, {0x09, "8"},
                               {0x0a, "9"}, {0x0c, "11"}, {0x0d, "12"}, {0x0e, "13"}, {0x0f, "8"}, {0x20, "1"}, {0x02, kUnknown}};
   for (TRow const& row : formFactors)
-    EXPECT_EQ(ModuleProperty(Module().Byte(0x0e, row.smbios), "FormFactor"), "uint16 " + row.cim) << row.smbios;
+    EXPECT_EQ(ModuleProperty(Module().Byte(0x0e, row.fSmbios), "FormFactor"), "uint16 " + row.fCim) << row.fSmbios;
 }
 
 TEST(MemoryRecordTest, UnknownWidthsAreNull) {

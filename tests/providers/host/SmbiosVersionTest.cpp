@@ -17,8 +17,8 @@ std::string VersionText(std::optional<TSmbiosVersion> const& version) {
 
 TEST(SmbiosVersionTest, EveryFormOfEntryPointHasItsVersion) {
   struct TRow {
-    std::string entryPoint;
-    char const* version;
+    std::string fEntryPoint;
+    char const* fVersion;
   } const rows[] = {
       {EntryPoint32(100), "2.8"},
       {EntryPoint32(100, 32, 0x1F, 0x203), "2.3"},
@@ -30,8 +30,8 @@ TEST(SmbiosVersionTest, EveryFormOfEntryPointHasItsVersion) {
       {EntryPointLegacy(100, 32, 0x21), "2.1"},
   };
   for (TRow const& row : rows) {
-    EXPECT_EQ(VersionText(VersionInEntryPoint(row.entryPoint)), row.version);
-    EXPECT_EQ(VersionText(VersionInEntryPoint(row.entryPoint + "a table")), row.version);
+    EXPECT_EQ(VersionText(VersionInEntryPoint(row.fEntryPoint)), row.fVersion);
+    EXPECT_EQ(VersionText(VersionInEntryPoint(row.fEntryPoint + "a table")), row.fVersion);
   }
 }
 

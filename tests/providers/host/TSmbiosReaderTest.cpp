@@ -154,7 +154,7 @@ protected:
 
 TEST_F(FakeSmbiosTest, TheLibrarysStatusIsTheReason) {
   struct TRow {
-    char const *behaviour, *code, *reason;
+    char const *fBehaviour, *fCode, *fReason;
   } const rows[] = {
       {"is missing its file", "no-smbios", "no SMBIOS tables exported"},
       {"is denied access", "needs-root", "needs root (SMBIOS tables)"},
@@ -164,11 +164,11 @@ TEST_F(FakeSmbiosTest, TheLibrarysStatusIsTheReason) {
       {"returns no handle", "unreadable", "the system's SMBIOS tables cannot be read"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.behaviour);
-    Load(FAKE_SMBIOS, row.behaviour);
-    EXPECT_EQ(fReader->WhyNone(1).fCode, row.code);
-    EXPECT_EQ(fReader->WhyNone(1).fReason, row.reason);
-    EXPECT_EQ(fReader->First(1).Text(5).Why().fCode, row.code);
+    SCOPED_TRACE(row.fBehaviour);
+    Load(FAKE_SMBIOS, row.fBehaviour);
+    EXPECT_EQ(fReader->WhyNone(1).fCode, row.fCode);
+    EXPECT_EQ(fReader->WhyNone(1).fReason, row.fReason);
+    EXPECT_EQ(fReader->First(1).Text(5).Why().fCode, row.fCode);
     EXPECT_TRUE(fReader->All(1).empty());
   }
 }

@@ -45,8 +45,8 @@ TEST(TSmbiosStructureTest, FieldsAfterTheFormattedAreaAreMissing) {
 
 TEST(TSmbiosStructureTest, NothingOutsideTheBytesIsRead) {
   struct TRow {
-    char const* description;
-    std::string bytes;
+    char const* fDescription;
+    std::string fBytes;
   } const rows[] = {
       {"nothing at all", ""},
       {"half a header", "\x01\x1b"s},
@@ -55,8 +55,8 @@ TEST(TSmbiosStructureTest, NothingOutsideTheBytesIsRead) {
       {"a length below that of the header", "\x01\0\0\0\1\1\0\0"s},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.description);
-    TSmbiosStructure const structure = StructureOf(row.bytes);
+    SCOPED_TRACE(row.fDescription);
+    TSmbiosStructure const structure = StructureOf(row.fBytes);
     EXPECT_EQ(ResultOf(structure.Byte(0x07)), kTooShort);
     EXPECT_EQ(ResultOf(structure.DWord(0x17)), kTooShort);
     EXPECT_FALSE(structure.Text(0x04)) << *structure.Text(0x04);
@@ -74,9 +74,9 @@ TEST(TSmbiosStructureTest, StringsAreCountedFromOne) {
 
 TEST(TSmbiosStructureTest, AStringThatTheStructureDoesNotContainIsMissing) {
   struct TRow {
-    char const* description;
-    std::string strings;
-    bool isPresent;
+    char const* fDescription;
+    std::string fStrings;
+    bool fIsPresent;
   } const rows[] = {
       {"fewer texts than the number", "first\0\0"s, false},
       {"no text at all", "\0\0"s, false},
@@ -86,11 +86,11 @@ TEST(TSmbiosStructureTest, AStringThatTheStructureDoesNotContainIsMissing) {
       {"an empty text ends the set", "first\0\0second\0\0"s, false},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.description);
-    TSmbiosStructure const structure = StructureOf("\x01\x05\0\0\2"s + row.strings);
+    SCOPED_TRACE(row.fDescription);
+    TSmbiosStructure const structure = StructureOf("\x01\x05\0\0\2"s + row.fStrings);
     EXPECT_EQ(
         ResultOf(structure.Text(4)),
-        row.isPresent ? "second" : "unexpected-form: the firmware refers to string 2, which the structure does not contain");
+        row.fIsPresent ? "second" : "unexpected-form: the firmware refers to string 2, which the structure does not contain");
   }
 }
 

@@ -7,8 +7,8 @@ namespace {
 
 TEST(CIMNamesTest, NameIsALetterOrUnderscoreThenLettersDigitsAndUnderscores) {
   struct {
-    std::string text;
-    bool isName;
+    std::string fText;
+    bool fIsName;
   } const rows[] = {
       {"X_Disk", true},       {"_", true},           {"a", true},    {"Z9", true},   {"__x__", true},
       {"\xc3\x84rger", true}, {"K\xc3\xb6ln", true}, {"", false},    {"9a", false},  {"a b", false},
@@ -16,19 +16,19 @@ TEST(CIMNamesTest, NameIsALetterOrUnderscoreThenLettersDigitsAndUnderscores) {
       {"a\x7f", false},       {"@a", false},         {"[a", false},  {"`a", false},  {"{a", false},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.text);
-    EXPECT_EQ(IsCIMName(row.text), row.isName);
-    if (row.isName)
-      EXPECT_NO_THROW(RequireCIMName(row.text));
+    SCOPED_TRACE(row.fText);
+    EXPECT_EQ(IsCIMName(row.fText), row.fIsName);
+    if (row.fIsName)
+      EXPECT_NO_THROW(RequireCIMName(row.fText));
     else
-      EXPECT_STATUS(RequireCIMName(row.text), kZEPStatusInvalidCIMName);
+      EXPECT_STATUS(RequireCIMName(row.fText), kZEPStatusInvalidCIMName);
   }
 }
 
 TEST(CIMNamesTest, NamesCompareWithoutRegardToTheCaseOfAToZ) {
   struct {
-    std::string a, b;
-    bool isSame;
+    std::string fA, fB;
+    bool fIsSame;
   } const rows[] = {
       {"X_Disk", "x_dISK", true},
       {"", "", true},
@@ -43,10 +43,10 @@ TEST(CIMNamesTest, NamesCompareWithoutRegardToTheCaseOfAToZ) {
       {"\xc3\x84", "\xc3\x84", true},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.a + " and " + row.b);
-    EXPECT_EQ(IsSameName(row.a, row.b), row.isSame);
-    EXPECT_EQ(FoldName(row.a) == FoldName(row.b), row.isSame);
-    EXPECT_EQ(TNameHash()(row.a) == TNameHash()(row.b), row.isSame);
+    SCOPED_TRACE(row.fA + " and " + row.fB);
+    EXPECT_EQ(IsSameName(row.fA, row.fB), row.fIsSame);
+    EXPECT_EQ(FoldName(row.fA) == FoldName(row.fB), row.fIsSame);
+    EXPECT_EQ(TNameHash()(row.fA) == TNameHash()(row.fB), row.fIsSame);
   }
   EXPECT_EQ(FoldName("X_Disk\xc3\x84"), "x_disk\xc3\x84");
 }

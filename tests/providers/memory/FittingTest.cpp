@@ -10,9 +10,9 @@ namespace {
 
 TEST(FittingTest, IntegerIsConvertedToTheDeclaredTypeWhenTheNumberFits) {
   struct {
-    char const* declared;
-    TCIMValue given;
-    char const* fitted;  // its text; null when the value is returned unchanged
+    char const* fDeclared;
+    TCIMValue fGiven;
+    char const* fFitted;  // its text; null when the value is returned unchanged
   } const rows[] = {
       {"uint8", TCIMValue(255), "255"},
       {"uint8", TCIMValue(256), nullptr},
@@ -41,15 +41,15 @@ TEST(FittingTest, IntegerIsConvertedToTheDeclaredTypeWhenTheNumberFits) {
       {"uint32[]", TCIMValue(1), nullptr},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(std::string(row.declared) + " from " + row.given.ToString());
-    TMemoryType const declared(row.declared);
-    TCIMValue const fitted = FittedTo(declared.GetNull(), row.given);
-    if (row.fitted) {
+    SCOPED_TRACE(std::string(row.fDeclared) + " from " + row.fGiven.ToString());
+    TMemoryType const declared(row.fDeclared);
+    TCIMValue const fitted = FittedTo(declared.GetNull(), row.fGiven);
+    if (row.fFitted) {
       EXPECT_EQ(fitted.GetType(), declared.GetType());
-      EXPECT_EQ(fitted.ToString(), row.fitted);
+      EXPECT_EQ(fitted.ToString(), row.fFitted);
     } else {
-      EXPECT_EQ(fitted.GetType(), row.given.GetType());
-      EXPECT_EQ(fitted, row.given);
+      EXPECT_EQ(fitted.GetType(), row.fGiven.GetType());
+      EXPECT_EQ(fitted, row.fGiven);
     }
   }
 }

@@ -23,10 +23,10 @@ TEST(StandardQualifiersTest, DeclarationsAreThoseOfTheStandard) {
   using Decl = ICIMQualifierDecl;
   constexpr unsigned int kDefault = 0x03, kRestricted = 0x01, kFinal = 0x02, kTranslatable = 0x07;
   struct {
-    char const* name;
-    char const* type;
-    char const* defaultValue;
-    unsigned int scope, flavor;
+    char const* fName;
+    char const* fType;
+    char const* fDefaultValue;
+    unsigned int fScope, fFlavor;
   } const rows[] = {
       {"Key", "boolean", "false", Decl::kScopeProperty | Decl::kScopeReference, kFinal},
       {"Association", "boolean", "false", Decl::kScopeAssociation, kFinal},
@@ -50,13 +50,13 @@ TEST(StandardQualifiersTest, DeclarationsAreThoseOfTheStandard) {
   auto const ns = NewNamespace();
   ns->DeclareStandardQualifiers();
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.name);
-    auto const decl = ns->GetQualifierDecl(row.name, kNone);
-    EXPECT_EQ(decl->GetName(kNone), row.name);
-    EXPECT_EQ(decl->GetType(kNone), TMemoryType(row.type).GetType());
-    EXPECT_EQ(TextOf(decl->GetDefaultValue(kNone)), row.defaultValue);
-    EXPECT_EQ(decl->GetScope(kNone), row.scope);
-    EXPECT_EQ(decl->GetFlavor(kNone), row.flavor);
+    SCOPED_TRACE(row.fName);
+    auto const decl = ns->GetQualifierDecl(row.fName, kNone);
+    EXPECT_EQ(decl->GetName(kNone), row.fName);
+    EXPECT_EQ(decl->GetType(kNone), TMemoryType(row.fType).GetType());
+    EXPECT_EQ(TextOf(decl->GetDefaultValue(kNone)), row.fDefaultValue);
+    EXPECT_EQ(decl->GetScope(kNone), row.fScope);
+    EXPECT_EQ(decl->GetFlavor(kNone), row.fFlavor);
   }
 }
 

@@ -113,9 +113,9 @@ TEST_F(TMemoryClassBuilderTest, QualifierHasItsDeclaredFlavor) {
 
 TEST_F(TMemoryClassBuilderTest, RefusalIsLoggedAndEarlierElementsRemain) {
   struct {
-    std::function<void(TMemoryClassBuilder&)> action;
-    EZEPStatusCode status;
-    char const* message;
+    std::function<void(TMemoryClassBuilder&)> fAction;
+    EZEPStatusCode fStatus;
+    char const* fMessage;
   } const rows[] = {
       {[](auto& cls) { cls.Property("Name", "text"); }, kZEPStatusTypeMismatch, "X_Disk.Name refused: kZEPStatusTypeMismatch"},
       {[](auto& cls) { cls.Property("Id", "uint8"); }, kZEPStatusAlreadyExists, "X_Disk.Id refused: kZEPStatusAlreadyExists"},
@@ -130,14 +130,14 @@ TEST_F(TMemoryClassBuilderTest, RefusalIsLoggedAndEarlierElementsRemain) {
   };
   auto builder = fNs->DefineClass("X_Disk").Key("Id", "uint32");
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.message);
+    SCOPED_TRACE(row.fMessage);
     std::vector<std::string> errors;
     OnNewThread([&] {
       TRootObject::GetCoreLogger()->ClearLog();
-      EXPECT_STATUS(row.action(builder), row.status);
+      EXPECT_STATUS(row.fAction(builder), row.fStatus);
       errors = LoggedMessages();
     });
-    EXPECT_THAT(errors, ElementsAre(row.message));
+    EXPECT_THAT(errors, ElementsAre(row.fMessage));
   }
   EXPECT_TRUE(builder.Class()->GetPropertyDecl("Id", kNone)->IsKey(kNone));
 }

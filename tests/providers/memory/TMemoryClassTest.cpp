@@ -63,18 +63,18 @@ TEST_F(TMemoryClassTest, PropertyDeclarationHasTypeBoundAndReferencedClassOfItsD
   TCIMValue toDevice = NullOf("reference");
   toDevice.SetReferencedClass(fDevice);
   struct {
-    char const* name;
-    TCIMValue defaultValue;
+    char const* fName;
+    TCIMValue fDefaultValue;
   } const rows[] = {{"Count", TCIMValue(7u)}, {"Name", NullOf("string")}, {"Bytes", NullOf("uint8[16]")}, {"On", toDevice}};
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.name);
-    auto const decl = fDisk->AddPropertyDecl(row.name, row.defaultValue, kNone);
-    EXPECT_EQ(fDisk->GetPropertyDecl(row.name, kNone), decl);
-    EXPECT_EQ(decl->GetName(kNone), row.name);
-    EXPECT_EQ(decl->GetType(kNone), row.defaultValue.GetType());
-    EXPECT_EQ(decl->GetDefaultValue(kNone), row.defaultValue);
-    EXPECT_EQ(decl->GetDefaultValue(kNone).GetMaxArraySize(), row.defaultValue.GetMaxArraySize());
-    EXPECT_EQ(decl->GetDefaultValue(kNone).GetReferencedClass(), row.defaultValue.GetReferencedClass());
+    SCOPED_TRACE(row.fName);
+    auto const decl = fDisk->AddPropertyDecl(row.fName, row.fDefaultValue, kNone);
+    EXPECT_EQ(fDisk->GetPropertyDecl(row.fName, kNone), decl);
+    EXPECT_EQ(decl->GetName(kNone), row.fName);
+    EXPECT_EQ(decl->GetType(kNone), row.fDefaultValue.GetType());
+    EXPECT_EQ(decl->GetDefaultValue(kNone), row.fDefaultValue);
+    EXPECT_EQ(decl->GetDefaultValue(kNone).GetMaxArraySize(), row.fDefaultValue.GetMaxArraySize());
+    EXPECT_EQ(decl->GetDefaultValue(kNone).GetReferencedClass(), row.fDefaultValue.GetReferencedClass());
     EXPECT_EQ(decl->GetOwner(kNone).lock(), fDisk);
     EXPECT_FALSE(decl->IsKey(kNone));
   }
@@ -94,9 +94,9 @@ TEST_F(TMemoryClassTest, PropertyDeclarationIsFoundInTheNearestClassInAnyCase) {
 TEST_F(TMemoryClassTest, PropertyDeclarationIsRefusedWithItsReason) {
   fDisk->AddPropertyDecl("Name", NullOf("string"), kNone);
   struct {
-    char const* name;
-    TCIMValue defaultValue;
-    EZEPStatusCode status;
+    char const* fName;
+    TCIMValue fDefaultValue;
+    EZEPStatusCode fStatus;
   } const rows[] = {
       {"NAME", NullOf("uint8"), kZEPStatusAlreadyExists},
       {"Id", TCIMValue(), kZEPStatusTypeMismatch},
@@ -104,8 +104,8 @@ TEST_F(TMemoryClassTest, PropertyDeclarationIsRefusedWithItsReason) {
       {"1d", NullOf("string"), kZEPStatusInvalidCIMName},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.name);
-    EXPECT_STATUS(fDisk->AddPropertyDecl(row.name, row.defaultValue, kNone), row.status);
+    SCOPED_TRACE(row.fName);
+    EXPECT_STATUS(fDisk->AddPropertyDecl(row.fName, row.fDefaultValue, kNone), row.fStatus);
   }
   EXPECT_THAT(Names(*fDisk, &ICIMClass::EnumeratePropertyDecls), ElementsAre("Name"));
 }
@@ -246,15 +246,15 @@ TEST_F(TMemoryClassInstanceTest, OnlyInstancesOfTheClassItselfAreCommitted) {
   auto const other = NewNamespace();
   other->DefineClass("X_Disk").Key("Id", "uint32");
   struct {
-    char const* description;
-    boost::shared_ptr<ICIMInstance> instance;
+    char const* fDescription;
+    boost::shared_ptr<ICIMInstance> fInstance;
   } const rows[] = {{"none", nullptr},
                     {"of the superclass", Make(*fDevice, 1)},
                     {"of a subclass", Make(*fSsd, 1)},
                     {"of another namespace", Make(*other->GetClass("X_Disk", kNone), 1)}};
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.description);
-    EXPECT_STATUS(fDisk->CommitInstance(row.instance, kNone), kZEPStatusInvalidInstance);
+    SCOPED_TRACE(row.fDescription);
+    EXPECT_STATUS(fDisk->CommitInstance(row.fInstance, kNone), kZEPStatusInvalidInstance);
   }
   EXPECT_THAT(InstancePaths(*fDevice), IsEmpty());
 }
@@ -309,9 +309,9 @@ TEST_F(TMemoryClassTest, MethodDeclarationsAreThoseOfTheClassItselfInTheirOrder)
 TEST_F(TMemoryClassTest, MethodDeclarationIsRefusedWithItsReason) {
   fDisk->AddMethodDecl("Reset", TType::kCIMTypeUint32, kNone);
   struct {
-    char const* name;
-    TType type;
-    EZEPStatusCode status;
+    char const* fName;
+    TType fType;
+    EZEPStatusCode fStatus;
   } const rows[] = {
       {"RESET", TType::kCIMTypeUint8, kZEPStatusAlreadyExists},
       {"A", TType::kCIMTypeInvalid, kZEPStatusTypeMismatch},
@@ -319,8 +319,8 @@ TEST_F(TMemoryClassTest, MethodDeclarationIsRefusedWithItsReason) {
       {"", TType::kCIMTypeUint32, kZEPStatusInvalidCIMName},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.name);
-    EXPECT_STATUS(fDisk->AddMethodDecl(row.name, row.type, kNone), row.status);
+    SCOPED_TRACE(row.fName);
+    EXPECT_STATUS(fDisk->AddMethodDecl(row.fName, row.fType, kNone), row.fStatus);
   }
   EXPECT_THAT(Names(*fDisk, &ICIMClass::EnumerateMethodDecls), ElementsAre("Reset"));
 }

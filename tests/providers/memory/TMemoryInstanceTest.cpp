@@ -53,8 +53,8 @@ TEST_F(TMemoryInstanceTest, PropertyAcceptsItsDeclaredTypeOnly) {
 TEST_F(TMemoryInstanceTest, PropertyAcceptsANewValueOfEachKind) {
   TCIMReference one(fNs, "ns:X_Disk.Id=\"1\"", kNone), two(fNs, "ns:X_Disk.Id=\"2\"", kNone);
   struct {
-    char const* type;
-    TCIMValue first, second;
+    char const* fType;
+    TCIMValue fFirst, fSecond;
   } const rows[] = {
       {"boolean", true, false},
       {"real64", 0.5, 1.5},
@@ -66,16 +66,16 @@ TEST_F(TMemoryInstanceTest, PropertyAcceptsANewValueOfEachKind) {
       {"string[2]", TCIMValue(TType::kCIMTypeString, 2, {}), TCIMValue(TType::kCIMTypeString, 2, {TCIMValue("x")})},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.type);
-    auto const cls = fNs->DefineClass("X_Of" + std::to_string(&row - rows)).Property("P", row.type).Class();
+    SCOPED_TRACE(row.fType);
+    auto const cls = fNs->DefineClass("X_Of" + std::to_string(&row - rows)).Property("P", row.fType).Class();
     auto const property = cls->CreateInstance(kNone)->GetProperty("P", kNone);
-    property->SetValue(row.first, kNone);
-    EXPECT_EQ(property->GetValue(kNone).ToString(), row.first.ToString());
-    property->SetValue(row.second, kNone);
-    EXPECT_EQ(property->GetValue(kNone).ToString(), row.second.ToString());
+    property->SetValue(row.fFirst, kNone);
+    EXPECT_EQ(property->GetValue(kNone).ToString(), row.fFirst.ToString());
+    property->SetValue(row.fSecond, kNone);
+    EXPECT_EQ(property->GetValue(kNone).ToString(), row.fSecond.ToString());
     property->SetValue(property->GetValue(kNone), kNone);
-    EXPECT_EQ(property->GetValue(kNone).ToString(), row.second.ToString());
-    EXPECT_EQ(property->GetValue(kNone).GetReferencedClass(), row.second.GetReferencedClass());
+    EXPECT_EQ(property->GetValue(kNone).ToString(), row.fSecond.ToString());
+    EXPECT_EQ(property->GetValue(kNone).GetReferencedClass(), row.fSecond.GetReferencedClass());
   }
 }
 

@@ -15,19 +15,19 @@ protected:
 
 TEST_F(TMemoryMethodDeclTest, ParameterHasItsNameTypeAndClass) {
   struct {
-    char const* name;
-    char const* type;
-    char const* className;
+    char const* fName;
+    char const* fType;
+    char const* fClassName;
   } const rows[] = {{"Zone", "string", ""},       {"Force", "boolean", ""},        {"Bytes", "uint8[16]", ""},
                     {"To", "reference", "X_Bay"}, {"All", "reference[]", "X_Bay"}, {"Any", "reference", ""}};
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.name);
-    TMemoryType const type(row.type);
-    auto const parameter = fMethod->AddParameterDecl(row.name, type.GetType(), type.GetMaxArraySize(), row.className, kNone);
-    EXPECT_EQ(parameter->GetName(kNone), row.name);
+    SCOPED_TRACE(row.fName);
+    TMemoryType const type(row.fType);
+    auto const parameter = fMethod->AddParameterDecl(row.fName, type.GetType(), type.GetMaxArraySize(), row.fClassName, kNone);
+    EXPECT_EQ(parameter->GetName(kNone), row.fName);
     EXPECT_EQ(parameter->GetType(kNone), type.GetType());
     EXPECT_EQ(parameter->GetMaxArraySize(kNone), type.GetMaxArraySize());
-    EXPECT_EQ(parameter->GetReferencedClassName(kNone), row.className);
+    EXPECT_EQ(parameter->GetReferencedClassName(kNone), row.fClassName);
     EXPECT_EQ(parameter->GetMethod(kNone).lock(), fMethod);
   }
   EXPECT_THAT(Names(*fMethod, &ICIMMethodDecl::EnumerateParameterDecls),
@@ -38,11 +38,11 @@ TEST_F(TMemoryMethodDeclTest, ParameterHasItsNameTypeAndClass) {
 TEST_F(TMemoryMethodDeclTest, ParameterIsRefusedWithItsReason) {
   fMethod->AddParameterDecl("Zone", TType::kCIMTypeString, 0, "", kNone);
   struct {
-    char const* name;
-    TType type;
-    unsigned int bound;
-    char const* className;
-    EZEPStatusCode status;
+    char const* fName;
+    TType fType;
+    unsigned int fBound;
+    char const* fClassName;
+    EZEPStatusCode fStatus;
   } const rows[] = {
       {"ZONE", TType::kCIMTypeUint8, 0, "", kZEPStatusAlreadyExists},
       {"A", TType::kCIMTypeInvalid, 0, "", kZEPStatusTypeMismatch},
@@ -52,8 +52,8 @@ TEST_F(TMemoryMethodDeclTest, ParameterIsRefusedWithItsReason) {
       {"A b", TType::kCIMTypeString, 0, "", kZEPStatusInvalidCIMName},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.name);
-    EXPECT_STATUS(fMethod->AddParameterDecl(row.name, row.type, row.bound, row.className, kNone), row.status);
+    SCOPED_TRACE(row.fName);
+    EXPECT_STATUS(fMethod->AddParameterDecl(row.fName, row.fType, row.fBound, row.fClassName, kNone), row.fStatus);
   }
   EXPECT_THAT(Names(*fMethod, &ICIMMethodDecl::EnumerateParameterDecls), ElementsAre("Zone"));
 }

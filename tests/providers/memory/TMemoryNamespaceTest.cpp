@@ -154,9 +154,9 @@ TEST(TMemoryNamespaceTest, QualifierDeclarationIsRefusedWithItsReason) {
   auto const ns = NewNamespace();
   ns->CreateQualifierDecl("Key", TCIMValue(false), 0, 0, kNone);
   struct {
-    char const* name;
-    TCIMValue defaultValue;
-    EZEPStatusCode status;
+    char const* fName;
+    TCIMValue fDefaultValue;
+    EZEPStatusCode fStatus;
   } const rows[] = {
       {"KEY", TCIMValue(false), kZEPStatusAlreadyExists},
       {"", TCIMValue(false), kZEPStatusInvalidCIMName},
@@ -167,8 +167,8 @@ TEST(TMemoryNamespaceTest, QualifierDeclarationIsRefusedWithItsReason) {
       {"A", TCIMValue(TType::kCIMTypeArrayFlag, 0), kZEPStatusTypeMismatch},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.name);
-    EXPECT_STATUS(ns->CreateQualifierDecl(row.name, row.defaultValue, 0, 0, kNone), row.status);
+    SCOPED_TRACE(row.fName);
+    EXPECT_STATUS(ns->CreateQualifierDecl(row.fName, row.fDefaultValue, 0, 0, kNone), row.fStatus);
   }
   EXPECT_THAT(Names(*ns, &ICIMNamespace::EnumerateQualifierDecls), ElementsAre("Key"));
 }
@@ -196,8 +196,8 @@ TEST_F(TMemoryNamespacePathTest, InstanceIsFoundUnderItsOwnClassAndAllItsKeys) {
   EXPECT_EQ(fDisk->GetPath(kNone).GetPath(), "X_Disk.Bus=\"sata\",Id=\"5\"");
   EXPECT_EQ(fNs->GetInstance(fDisk->GetPath(kNone), kNone), fDisk);
   struct {
-    char const* path;
-    bool finds;
+    char const* fPath;
+    bool fFinds;
   } const rows[] = {
       {"X_Disk.Bus=\"sata\",Id=\"5\"", true},
       {"X_Disk.Id=\"5\",Bus=\"sata\"", true},
@@ -210,8 +210,8 @@ TEST_F(TMemoryNamespacePathTest, InstanceIsFoundUnderItsOwnClassAndAllItsKeys) {
       {"X_Disk.Bus=\"sata\",Id=\"05\"", true},  // read as the number 5
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.path);
-    EXPECT_EQ(Find(row.path), row.finds ? fDisk : nullptr);
+    SCOPED_TRACE(row.fPath);
+    EXPECT_EQ(Find(row.fPath), row.fFinds ? fDisk : nullptr);
   }
 }
 
@@ -272,8 +272,8 @@ TEST_F(TMemoryNamespacePathTest, KeysOfEachKindAreFoundByValue) {
   TCIMReference diskPath = fDisk->GetPath(kNone);
   TCIMReference devicePath = fDevice->GetPath(kNone);
   struct {
-    char const* type;
-    TCIMValue value, other;
+    char const* fType;
+    TCIMValue fValue, fOther;
   } const rows[] = {
       {"boolean", TCIMValue(true), TCIMValue(false)},
       {"uint8", TCIMValue(static_cast<unsigned char>(65)), TCIMValue(static_cast<unsigned char>(66))},
@@ -286,14 +286,14 @@ TEST_F(TMemoryNamespacePathTest, KeysOfEachKindAreFoundByValue) {
       {"reference", TCIMValue(diskPath), TCIMValue(devicePath)},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.type);
-    std::string const name = std::string("X_By_") + row.type;
-    fNs->DefineClass(name).Key("K", row.type);
-    auto const instance = fNs->AddInstance(name, {{"K", row.value}});
-    auto const other = fNs->AddInstance(name, {{"K", row.other}});
+    SCOPED_TRACE(row.fType);
+    std::string const name = std::string("X_By_") + row.fType;
+    fNs->DefineClass(name).Key("K", row.fType);
+    auto const instance = fNs->AddInstance(name, {{"K", row.fValue}});
+    auto const other = fNs->AddInstance(name, {{"K", row.fOther}});
     EXPECT_EQ(fNs->GetInstance(instance->GetPath(kNone), kNone), instance);
     EXPECT_EQ(fNs->GetInstance(other->GetPath(kNone), kNone), other);
-    EXPECT_STATUS(fNs->AddInstance(name, {{"K", row.value}}), kZEPStatusAlreadyExists);
+    EXPECT_STATUS(fNs->AddInstance(name, {{"K", row.fValue}}), kZEPStatusAlreadyExists);
   }
 }
 
@@ -347,9 +347,9 @@ TEST(TMemoryNamespaceTest, RefusalIsLoggedAndTravelsWithTheFailure) {
   ns->AddInstance("X_Disk", {{"Id", 5}});
   ns->DefineClass("X_Idea", "X_Disk").Abstract();
   struct {
-    std::function<void()> action;
-    EZEPStatusCode status;
-    char const* message;
+    std::function<void()> fAction;
+    EZEPStatusCode fStatus;
+    char const* fMessage;
   } const rows[] = {
       {[&] { ns->DefineClass("x_disk"); }, kZEPStatusAlreadyExists, "x_disk refused: kZEPStatusAlreadyExists"},
       {[&] { ns->DefineClass("X-Disk"); }, kZEPStatusInvalidCIMName, "X-Disk refused: kZEPStatusInvalidCIMName"},
@@ -370,9 +370,9 @@ TEST(TMemoryNamespaceTest, RefusalIsLoggedAndTravelsWithTheFailure) {
        kZEPStatusAlreadyExists, "X_Disk refused: kZEPStatusAlreadyExists"},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.message);
-    EXPECT_THAT(ErrorsOf([&] { EXPECT_STATUS(row.action(), row.status); }), ElementsAre(row.message));
-    EXPECT_EQ(ReasonOf(row.action), row.message);
+    SCOPED_TRACE(row.fMessage);
+    EXPECT_THAT(ErrorsOf([&] { EXPECT_STATUS(row.fAction(), row.fStatus); }), ElementsAre(row.fMessage));
+    EXPECT_EQ(ReasonOf(row.fAction), row.fMessage);
   }
   EXPECT_THAT(ClassNames(*ns), ElementsAre("X_Disk"));
   EXPECT_THAT(InstancePaths(*ns->GetClass("X_Disk", kNone)), ElementsAre("X_Disk.Id=\"5\""));

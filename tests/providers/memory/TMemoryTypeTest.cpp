@@ -7,9 +7,9 @@ namespace {
 
 TEST(TMemoryTypeTest, TypesAreReadAsInSchemas) {
   struct {
-    char const* text;
-    int type;
-    unsigned int bound;
+    char const* fText;
+    int fType;
+    unsigned int fBound;
   } const rows[] = {
       {"boolean", 1, 0},
       {"uint8", 2, 0},
@@ -47,10 +47,10 @@ TEST(TMemoryTypeTest, TypesAreReadAsInSchemas) {
       {"string[ 4]", 0, 0},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.text);
-    TMemoryType const type(row.text);
-    EXPECT_EQ(type.GetType(), row.type);
-    EXPECT_EQ(type.GetMaxArraySize(), row.bound);
+    SCOPED_TRACE(row.fText);
+    TMemoryType const type(row.fText);
+    EXPECT_EQ(type.GetType(), row.fType);
+    EXPECT_EQ(type.GetMaxArraySize(), row.fBound);
   }
 }
 

@@ -28,9 +28,9 @@ TEST(MofNumbersTest, ANumberThatDoesNotFitItsTypeIsRefused) {
 
 TEST(MofNumbersTest, ANumberIsReadInItsBaseAndType) {
   struct TRow {
-    char const* text;
-    TType type;
-    TCIMValue value;
+    char const* fText;
+    TType fType;
+    TCIMValue fValue;
   };
   TMofFile const file{"numbers", "1"};
   for (TRow const& row : {TRow{"0x1F", TType::kCIMTypeUint32, TCIMValue(31u)}, TRow{"017", TType::kCIMTypeUint32, TCIMValue(15u)},
@@ -38,8 +38,8 @@ TEST(MofNumbersTest, ANumberIsReadInItsBaseAndType) {
                           TRow{"-0x80", TType::kCIMTypeSint8, TCIMValue(static_cast<signed char>(-128))},
                           TRow{"65", TType::kCIMTypeChar16, TCIMValue(TCIMChar16(65))},
                           TRow{"-1.5e2", TType::kCIMTypeReal32, TCIMValue(-150.0f)}}) {
-    SCOPED_TRACE(row.text);
-    EXPECT_EQ(ReadMofNumber(row.text, row.type, {&file, file.fText}), row.value);
+    SCOPED_TRACE(row.fText);
+    EXPECT_EQ(ReadMofNumber(row.fText, row.fType, {&file, file.fText}), row.fValue);
   }
 }
 

@@ -51,13 +51,13 @@ inline std::string ErrorOf(std::string const& text) {
 }
 
 struct TErrorRow {
-  std::string text, error;
+  std::string fText, fError;
 };
 
 inline void ExpectErrors(std::vector<TErrorRow> const& rows) {
   for (TErrorRow const& row : rows) {
-    SCOPED_TRACE(row.text);
-    EXPECT_EQ(ErrorOf(row.text), row.error);
+    SCOPED_TRACE(row.fText);
+    EXPECT_EQ(ErrorOf(row.fText), row.fError);
   }
 }
 

@@ -12,8 +12,8 @@ namespace {
 
 TEST(MofValuesTest, ValuesOfEveryTypeAreRead) {
   struct TRow {
-    char const* declaration;
-    TCIMValue value;
+    char const* fDeclaration;
+    TCIMValue fValue;
   };
   for (TRow const& row : {
            TRow{"boolean P = TRUE;", TCIMValue(true)},
@@ -46,10 +46,10 @@ TEST(MofValuesTest, ValuesOfEveryTypeAreRead) {
            TRow{"string P[4] = {};", TCIMValue(TType::kCIMTypeString, 4, {})},
            TRow{"string P[] = {\"a\" \"b\", NULL};", TCIMValue(TType::kCIMTypeString, 0, {TCIMValue("ab"), NullOf("string")})},
        }) {
-    SCOPED_TRACE(row.declaration);
-    TCIMValue const value = DefaultOf(row.declaration);
-    EXPECT_EQ(value, row.value);
-    EXPECT_EQ(value.GetMaxArraySize(), row.value.GetMaxArraySize());
+    SCOPED_TRACE(row.fDeclaration);
+    TCIMValue const value = DefaultOf(row.fDeclaration);
+    EXPECT_EQ(value, row.fValue);
+    EXPECT_EQ(value.GetMaxArraySize(), row.fValue.GetMaxArraySize());
   }
   for (char const* declaration : {"uint8 P = NULL;", "string P[3] = null;", "char16 P = Null;"})
     EXPECT_TRUE(DefaultOf(declaration).IsNull()) << declaration;

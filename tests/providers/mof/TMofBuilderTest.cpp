@@ -7,10 +7,10 @@ namespace {
 TEST(TMofBuilderTest, AQualifierDeclarationHasTypeDefaultScopeAndFlavor) {
   using Q = ICIMQualifierDecl;
   struct TRow {
-    std::string text;
-    int type;
-    std::string value;
-    unsigned int scope, flavor;
+    std::string fText;
+    int fType;
+    std::string fValue;
+    unsigned int fScope, fFlavor;
   };
   for (TRow const& row : {
            TRow{"Qualifier Q : boolean = TRUE, Scope(any);", TType::kCIMTypeBoolean, "true", Q::kScopeAny, Q::kFlavorDefault},
@@ -25,13 +25,13 @@ TEST(TMofBuilderTest, AQualifierDeclarationHasTypeDefaultScopeAndFlavor) {
            TRow{"Qualifier Q : uint8[3], Scope(), Flavor(ToSubclass Translatable);",
                 TType::kCIMTypeUint8 | TType::kCIMTypeArrayFlag, "NULL", 0, Q::kFlavorDefault | Q::kFlavorTranslatable},
        }) {
-    SCOPED_TRACE(row.text);
-    auto const decl = Read(row.text)->GetQualifierDecl("Q", kNone);
-    EXPECT_EQ(decl->GetType(kNone), row.type);
+    SCOPED_TRACE(row.fText);
+    auto const decl = Read(row.fText)->GetQualifierDecl("Q", kNone);
+    EXPECT_EQ(decl->GetType(kNone), row.fType);
     TCIMValue const value = decl->GetDefaultValue(kNone);
-    EXPECT_EQ(value.IsNull() ? "NULL" : value.ToString(), row.value);
-    EXPECT_EQ(decl->GetScope(kNone), row.scope);
-    EXPECT_EQ(decl->GetFlavor(kNone), row.flavor);
+    EXPECT_EQ(value.IsNull() ? "NULL" : value.ToString(), row.fValue);
+    EXPECT_EQ(decl->GetScope(kNone), row.fScope);
+    EXPECT_EQ(decl->GetFlavor(kNone), row.fFlavor);
   }
   EXPECT_EQ(Read("Qualifier Q : uint8[3], Scope(any);")->GetQualifierDecl("Q", kNone)->GetDefaultValue(kNone).GetMaxArraySize(),
             3u);
@@ -101,18 +101,18 @@ TEST(TMofBuilderTest, AQualifierWithoutValueIsTrueOrTheDeclaredDefault) {
 TEST(TMofBuilderTest, AQualifierHasTheDeclaredFlavorUnlessItStatesAnother) {
   using Q = ICIMQualifierDecl;
   struct TRow {
-    char const* text;
-    unsigned int flavor;
+    char const* fText;
+    unsigned int fFlavor;
   };
   for (TRow const& row : {TRow{"Description(\"a\")", Q::kFlavorDefault | Q::kFlavorTranslatable},
                           TRow{"Description(\"a\") : DisableOverride", Q::kFlavorToSubclass},
                           TRow{"Description(\"a\") : Restricted translatable", Q::kFlavorEnableOverride | Q::kFlavorTranslatable},
                           TRow{"Values {\"a\"} : ToSubclass", Q::kFlavorDefault},
                           TRow{"Key : Restricted", Q::kFlavorEnableOverride}, TRow{"Key", Q::kFlavorToSubclass}}) {
-    auto const ns = Read(std::string("class X_A { [") + row.text + "] string P; };");
+    auto const ns = Read(std::string("class X_A { [") + row.fText + "] string P; };");
     auto const qualifiers = All(*Property(*ns, "X_A", "P"), &ICIMNamedElement::EnumerateQualifiers);
-    ASSERT_EQ(qualifiers.size(), 1u) << row.text;
-    EXPECT_EQ(qualifiers.front()->GetFlavor(kNone), row.flavor) << row.text;
+    ASSERT_EQ(qualifiers.size(), 1u) << row.fText;
+    EXPECT_EQ(qualifiers.front()->GetFlavor(kNone), row.fFlavor) << row.fText;
   }
 }
 

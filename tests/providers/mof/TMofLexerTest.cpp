@@ -30,8 +30,8 @@ TEST(TMofLexerTest, ATextIsSplitIntoTokens) {
 
 TEST(TMofLexerTest, EachKindOfTokenHasItsText) {
   struct TRow {
-    char const* text;
-    std::vector<std::string> tokens;
+    char const* fText;
+    std::vector<std::string> fTokens;
   };
   for (TRow const& row : {
            TRow{"_a9 \xc3\xa9", {"name _a9", "name \xc3\xa9"}},
@@ -44,8 +44,8 @@ TEST(TMofLexerTest, EachKindOfTokenHasItsText) {
            TRow{"\"// no comment\" // a \"comment\"\n;", {"string \"// no comment\"", "mark ;"}},
            TRow{"a/* \n * b **/c", {"name a", "name c"}},
        }) {
-    SCOPED_TRACE(row.text);
-    EXPECT_EQ(TokensOf(row.text), row.tokens);
+    SCOPED_TRACE(row.fText);
+    EXPECT_EQ(TokensOf(row.fText), row.fTokens);
   }
 }
 

@@ -32,12 +32,12 @@ protected:
     EnterNetworkNamespace();
     StartController();
   }
-  void TearDown() override { fClient.close(); }
+  void TearDown() override { fClient.fClose(); }
 
   void StartController() {
     fSimulator.reset();
     TSimulator::TSettings settings;
-    settings.port = kControllersPort;
+    settings.fPort = kControllersPort;
     fSimulator.emplace(settings);
     fSimulator->WaitUntilReady();
   }
@@ -46,18 +46,18 @@ protected:
   void Relay(EVersion version, TRelay::TRule const& rule) {
     fRelay.reset();
     fRelay.emplace(623, kControllersPort, [version, rule](TRelay::TDatagram& datagram) {
-      if (version == kVersion15 && datagram.isAnswer) datagram.bytes = WithoutVersion2(datagram.bytes);
+      if (version == kVersion15 && datagram.fIsAnswer) datagram.fBytes = WithoutVersion2(datagram.fBytes);
       return rule(datagram);
     });
   }
 
   // The number of events that the controller has logged meanwhile; it is queried without the bad network.
   int NewEvents() {
-    fClient.close();
+    fClient.fClose();
     fClient.Open(kControllersPort);
     int const before = fEvents;
     fEvents = fClient.Events();
-    fClient.close();
+    fClient.fClose();
     return fEvents - before;
   }
 
@@ -70,12 +70,12 @@ protected:
 // ---- One mishap to one packet ----
 
 struct TMishap {
-  char const* name;
-  EVersion version;
-  TFate fate;
+  char const* fName;
+  EVersion fVersion;
+  TFate fFate;
 };
 
-void PrintTo(TMishap const& mishap, std::ostream* out) { *out << mishap.name; }
+void PrintTo(TMishap const& mishap, std::ostream* out) { *out << mishap.fName; }
 
 class MishapTest : public BadNetworkTest, public testing::WithParamInterface<TMishap> {};
 
@@ -84,19 +84,19 @@ int PlacesIn(EVersion version) { return version == kVersion2 ? 7 : 6; }
 
 TEST_P(MishapTest, IsOvercomeAtEveryPlace) {
   TMishap const& mishap = GetParam();
-  int const places = PlacesIn(mishap.version), placeOfCommand = places - 2;
+  int const places = PlacesIn(mishap.fVersion), placeOfCommand = places - 2;
   for (bool const isAnswer : {false, true})
     for (int place = 0; place < places; ++place) {
       SCOPED_TRACE((isAnswer ? "answer " : "request ") + std::to_string(place));
-      Relay(mishap.version, [&mishap, isAnswer, place](TRelay::TDatagram const& datagram) {
-        return datagram.isAnswer == isAnswer && datagram.place == place ? mishap.fate : TRelay::AtOnce();
+      Relay(mishap.fVersion, [&mishap, isAnswer, place](TRelay::TDatagram const& datagram) {
+        return datagram.fIsAnswer == isAnswer && datagram.fPlace == place ? mishap.fFate : TRelay::AtOnce();
       });
       EXPECT_EQ(fClient.Open(623), kIpmiClientOk);
       EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
-      fClient.close();
+      fClient.fClose();
       // The simulator executes a command again that arrives twice: one whose answer was lost, or one that the network copied. A
       // query that is repeated because this machine is busy moves the places by one.
-      bool const mayComeTwice = place >= placeOfCommand && mishap.fate.size() != 1;
+      bool const mayComeTwice = place >= placeOfCommand && mishap.fFate.size() != 1;
       EXPECT_THAT(NewEvents(), testing::AllOf(testing::Ge(1), testing::Le(mayComeTwice ? 2 : 1)));
     }
 }
@@ -107,7 +107,7 @@ INSTANTIATE_TEST_SUITE_P(All, MishapTest,
                                          TMishap{"LateCopy2", kVersion2, {0ms, 30ms, 300ms}},
                                          TMishap{"LateCopy15", kVersion15, {0ms, 30ms, 300ms}},
                                          TMishap{"Delay2", kVersion2, {1300ms}}, TMishap{"Delay15", kVersion15, {1300ms}}),
-                         [](auto const& row) { return row.param.name; });
+                         [](auto const& row) { return row.param.fName; });
 
 // ---- Mishaps to many packets ----
 
@@ -126,10 +126,10 @@ TEST_P(EachVersionTest, EveryPacketMayArriveTwice) {
 }
 
 TEST_P(EachVersionTest, AnswersMayTake3Seconds) {
-  Relay(GetParam(), [](auto const& datagram) { return TFate{datagram.isAnswer ? 3000ms : 0ms}; });
+  Relay(GetParam(), [](auto const& datagram) { return TFate{datagram.fIsAnswer ? 3000ms : 0ms}; });
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
-  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).fData, "\x07KQ12345");
   EXPECT_EQ(NewEvents(), 1) << "a slow controller receives a command once";
 }
 
@@ -150,7 +150,7 @@ TEST_P(EachVersionTest, AFifthMayBeLostAndAFifthDuplicatedAndAllReordered) {
       return lot == 0 ? TFate{} : lot == 1 ? TFate{delay, another} : TFate{delay};
     });
     ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
-    EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+    EXPECT_EQ(fClient.ReadFru(0x1CC, 7).fData, "\x07KQ12345");
     EXPECT_EQ(fClient.AddEvent(), kIpmiClientOk);
     EXPECT_GE(NewEvents(), 1);
   }
@@ -158,10 +158,10 @@ TEST_P(EachVersionTest, AFifthMayBeLostAndAFifthDuplicatedAndAllReordered) {
 
 TEST_F(BadNetworkTest, AFifthMayBeLostWhenAnswersTake3Seconds) {
   Relay(kVersion2, [random = std::mt19937(7)](auto const& datagram) mutable {
-    return random() % 5 == 0 ? TFate{} : TFate{datagram.isAnswer ? 3000ms : 0ms};
+    return random() % 5 == 0 ? TFate{} : TFate{datagram.fIsAnswer ? 3000ms : 0ms};
   });
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
-  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).fData, "\x07KQ12345");
 }
 
 // ---- A command is executed once ----
@@ -183,7 +183,7 @@ std::vector<std::string> OfCommand(std::vector<std::string> datagrams, char comm
 TEST_F(BadNetworkTest, ARepeatedCommandHasTheSameRequestNumber) {
   constexpr char kAddEvent = 0x44;
   Relay(kVersion15, [answers = 0](auto const& datagram) mutable {
-    bool const isLost = datagram.isAnswer && IsOfCommand(datagram.bytes, kAddEvent) && ++answers <= 2;
+    bool const isLost = datagram.fIsAnswer && IsOfCommand(datagram.fBytes, kAddEvent) && ++answers <= 2;
     return isLost ? TFate{} : TRelay::AtOnce();
   });
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
@@ -233,8 +233,8 @@ TEST_F(BadNetworkTest, AnEchoAtEveryLaterPlaceIsAnInvalidAnswer) {
   for (int place = 1; place < placeOfCommand; ++place) {
     SCOPED_TRACE(place);
     Relay(kVersion2, [place, request = std::string()](TRelay::TDatagram& datagram) mutable {
-      if (!datagram.isAnswer) request = datagram.bytes;
-      if (datagram.isAnswer && datagram.place >= place) datagram.bytes = request;
+      if (!datagram.fIsAnswer) request = datagram.fBytes;
+      if (datagram.fIsAnswer && datagram.fPlace >= place) datagram.fBytes = request;
       return TRelay::AtOnce();
     });
     EXPECT_EQ(fClient.Open(623), kIpmiClientFail);
@@ -245,7 +245,7 @@ TEST_F(BadNetworkTest, AnEchoAtEveryLaterPlaceIsAnInvalidAnswer) {
 TEST_F(BadNetworkTest, APrivilegeLostThroughALateCopyIsRequestedAgain) {
   constexpr char kFirstNumber = 0x12;  // RAKP message 1
   Relay(kVersion2, [](auto const& datagram) {
-    bool const isCopied = !datagram.isAnswer && datagram.bytes[5] == kFirstNumber;
+    bool const isCopied = !datagram.fIsAnswer && datagram.fBytes[5] == kFirstNumber;
     return isCopied ? TFate{0ms, 500ms} : TRelay::AtOnce();
   });
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
@@ -259,13 +259,13 @@ TEST_F(BadNetworkTest, AnOpeningWithAWrongProofIsRestarted) {
   constexpr char kProof = 0x14;  // RAKP message 3
   auto const proofs = std::make_shared<std::atomic<int>>(0);
   Relay(kVersion2, [proofs](TRelay::TDatagram& datagram) {
-    bool const isFirst = !datagram.isAnswer && datagram.bytes[5] == kProof && (*proofs)++ == 0;
-    if (isFirst) datagram.bytes.back() = static_cast<char>(datagram.bytes.back() ^ 1);
+    bool const isFirst = !datagram.fIsAnswer && datagram.fBytes[5] == kProof && (*proofs)++ == 0;
+    if (isFirst) datagram.fBytes.back() = static_cast<char>(datagram.fBytes.back() ^ 1);
     return TRelay::AtOnce();
   });
   EXPECT_EQ(fClient.Open(623), kIpmiClientOk);
   EXPECT_GE(*proofs, 2);
-  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).fData, "\x07KQ12345");
 }
 
 }  // namespace

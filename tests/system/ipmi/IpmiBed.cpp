@@ -71,11 +71,11 @@ TSimulator::TSimulator(TSettings const& settings) {
   if (::pipe2(ends, O_CLOEXEC) != 0) throw std::runtime_error("no pipe");
   fOutput.reset(ends[0]);
   TUniqueFd const output(ends[1]);
-  std::string const port = std::to_string(settings.port);
-  std::vector<char const*> arguments = {ZEP_IPMI_SIM_START,       "--addr",   settings.address.c_str(),      "--model",
-                                        settings.model.c_str(),   "--serial", settings.serialNumber.c_str(), "--password",
-                                        settings.password.c_str()};
-  if (!settings.fru.empty()) arguments.insert(arguments.end(), {"--fru", settings.fru.c_str()});
+  std::string const port = std::to_string(settings.fPort);
+  std::vector<char const*> arguments = {ZEP_IPMI_SIM_START,        "--addr",   settings.fAddress.c_str(),      "--model",
+                                        settings.fModel.c_str(),   "--serial", settings.fSerialNumber.c_str(), "--password",
+                                        settings.fPassword.c_str()};
+  if (!settings.fFru.empty()) arguments.insert(arguments.end(), {"--fru", settings.fFru.c_str()});
   arguments.insert(arguments.end(), {port.c_str(), nullptr});
   fScript = ::fork();
   if (fScript == 0) {
@@ -127,8 +127,8 @@ void TUdpPeer::Run() {
 }
 
 struct TRelay::TWaiting {
-  bool isAnswer;
-  std::string bytes;
+  bool fIsAnswer;
+  std::string fBytes;
 };
 
 TRelay::TRelay(int port, int controllersPort, TRule rule)
@@ -162,18 +162,18 @@ void TRelay::Take(bool isAnswer) {
                         Receive((isAnswer ? fController : fClients).get(), isAnswer ? nullptr : &fClient)};
   if (!isAnswer) {
     std::lock_guard const lock(fMutex);
-    fRequests.push_back(datagram.bytes);
+    fRequests.push_back(datagram.fBytes);
   }
   for (auto const delay : fRule(datagram))
-    fWaiting.emplace(std::chrono::steady_clock::now() + delay, TWaiting{isAnswer, datagram.bytes});
+    fWaiting.emplace(std::chrono::steady_clock::now() + delay, TWaiting{isAnswer, datagram.fBytes});
 }
 
 void TRelay::PassOn(TWaiting const& waiting) {
-  if (waiting.isAnswer)
-    ::sendto(fClients.get(), waiting.bytes.data(), waiting.bytes.size(), 0, reinterpret_cast<sockaddr*>(&fClient),
+  if (waiting.fIsAnswer)
+    ::sendto(fClients.get(), waiting.fBytes.data(), waiting.fBytes.size(), 0, reinterpret_cast<sockaddr*>(&fClient),
              sizeof fClient);
   else
-    ::send(fController.get(), waiting.bytes.data(), waiting.bytes.size(), 0);
+    ::send(fController.get(), waiting.fBytes.data(), waiting.fBytes.size(), 0);
 }
 
 std::optional<std::string> AskOf(int port, std::string const& datagram) {
@@ -204,13 +204,13 @@ std::string WithoutVersion2(std::string answer) {
 TIpmiClientLibrary::TIpmiClientLibrary() {
   void* const library = ::dlopen(ZEP_BUILD_DIR "/lib/libipmiClient.so", RTLD_NOW);
   if (library == nullptr) throw std::runtime_error(::dlerror());
-  open = FunctionOf<decltype(OpenConnection)>(library, "OpenConnection");
-  send = FunctionOf<decltype(SendIpmiCommand)>(library, "SendIpmiCommand");
-  close = FunctionOf<decltype(CloseConnection)>(library, "CloseConnection");
+  fOpen = FunctionOf<decltype(OpenConnection)>(library, "OpenConnection");
+  fSend = FunctionOf<decltype(SendIpmiCommand)>(library, "SendIpmiCommand");
+  fClose = FunctionOf<decltype(CloseConnection)>(library, "CloseConnection");
 }
 
 int TIpmiClientLibrary::Open(int port, char const* host) const {
-  return open(kIpmiClientLan, host, std::to_string(port).c_str(), "zepadmin", "zeppass1");
+  return fOpen(kIpmiClientLan, host, std::to_string(port).c_str(), "zepadmin", "zeppass1");
 }
 
 TIpmiClientLibrary::TRead TIpmiClientLibrary::ReadFru(unsigned offset, unsigned char count, unsigned char device) const {
@@ -220,9 +220,9 @@ TIpmiClientLibrary::TRead TIpmiClientLibrary::ReadFru(unsigned offset, unsigned 
   unsigned short length = 0;
   unsigned char completionCode = 0xFF;
   TRead read;
-  read.result = send(0x11, request, sizeof request, response, &length, &completionCode, 0x0A);
-  read.completionCode = completionCode;
-  read.data.assign(reinterpret_cast<char const*>(response), length);
+  read.fResult = fSend(0x11, request, sizeof request, response, &length, &completionCode, 0x0A);
+  read.fCompletionCode = completionCode;
+  read.fData.assign(reinterpret_cast<char const*>(response), length);
   return read;
 }
 
@@ -231,14 +231,14 @@ int TIpmiClientLibrary::AddEvent() const {
   unsigned char response[kIpmiClientResponseSize];
   unsigned short length = 0;
   unsigned char completionCode = 0xFF;
-  return send(0x44, entry, sizeof entry, response, &length, &completionCode, 0x0A);
+  return fSend(0x44, entry, sizeof entry, response, &length, &completionCode, 0x0A);
 }
 
 int TIpmiClientLibrary::Events() const {
   unsigned char response[kIpmiClientResponseSize];
   unsigned short length = 0;
   unsigned char completionCode = 0xFF;
-  bool const isTold = send(0x40, nullptr, 0, response, &length, &completionCode, 0x0A) == kIpmiClientOk && length > 2;
+  bool const isTold = fSend(0x40, nullptr, 0, response, &length, &completionCode, 0x0A) == kIpmiClientOk && length > 2;
   return isTold ? response[1] + 256 * response[2] : -1;
 }
 

@@ -32,12 +32,12 @@ void EnterNetworkNamespace();
 class TSimulator {
 public:
   struct TSettings {
-    std::string address = "127.0.0.1";
-    int port = 623;
-    std::string model = "1234AB7";
-    std::string serialNumber = "KQ12345";
-    std::string password = "zeppass1";
-    std::string fru = {};  // a complete FRU image instead of the two texts
+    std::string fAddress = "127.0.0.1";
+    int fPort = 623;
+    std::string fModel = "1234AB7";
+    std::string fSerialNumber = "KQ12345";
+    std::string fPassword = "zeppass1";
+    std::string fFru = {};  // a complete FRU image instead of the two texts
   };
 
   explicit TSimulator(TSettings const& settings);
@@ -83,9 +83,9 @@ private:
 class TRelay {
 public:
   struct TDatagram {
-    bool isAnswer;
-    int place;  // the number of the datagram in its direction, from 0
-    std::string bytes;
+    bool fIsAnswer;
+    int fPlace;  // the number of the datagram in its direction, from 0
+    std::string fBytes;
   };
   // The delay of each copy of a datagram; without a delay, the datagram is lost.
   using TFate = std::vector<std::chrono::milliseconds>;
@@ -127,18 +127,18 @@ std::string WithoutVersion2(std::string answer);
 struct TIpmiClientLibrary {
   TIpmiClientLibrary();
 
-  decltype(&OpenConnection) open;
-  decltype(&SendIpmiCommand) send;
-  decltype(&CloseConnection) close;
+  decltype(&OpenConnection) fOpen;
+  decltype(&SendIpmiCommand) fSend;
+  decltype(&CloseConnection) fClose;
 
   // Opens a session as zepadmin.
   int Open(int port, char const* host = "127.0.0.1") const;
 
   // Reads FRU data of device 0.
   struct TRead {
-    int result;
-    int completionCode;
-    std::string data;  // the count and the data after it
+    int fResult;
+    int fCompletionCode;
+    std::string fData;  // the count and the data after it
   };
   TRead ReadFru(unsigned offset, unsigned char count, unsigned char device = 0) const;
 

@@ -30,7 +30,7 @@ protected:
     NEEDS(HasIpmiBed(), kIpmiBedNeeds);
     EnterNetworkNamespace();
   }
-  void TearDown() override { fClient.close(); }
+  void TearDown() override { fClient.fClose(); }
 
   TSimulator& Start(TSimulator::TSettings const& settings = {}) {
     fSimulator.reset();
@@ -48,49 +48,49 @@ TEST_F(IpmiClientTest, ReadsFruData) {
   Start();
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   auto const read = fClient.ReadFru(0x1AC, 0x1E);
-  EXPECT_EQ(read.result, kIpmiClientOk);
-  EXPECT_EQ(read.completionCode, 0);
-  EXPECT_EQ(read.data,
+  EXPECT_EQ(read.fResult, kIpmiClientOk);
+  EXPECT_EQ(read.fCompletionCode, 0);
+  EXPECT_EQ(read.fData,
             "\x1E"
             "1234AB7\0"s +
                 std::string(22, ' '));
-  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).fData, "\x07KQ12345");
 }
 
 TEST_F(IpmiClientTest, ARefusedCommandReturnsTheCompletionCode) {
   Start();
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   struct TRow {
-    char const* what;
-    unsigned offset;
-    unsigned char device;
-    int completionCode;
+    char const* fWhat;
+    unsigned fOffset;
+    unsigned char fDevice;
+    int fCompletionCode;
   };
   TRow const rows[] = {{"an offset after the data", 0x7000, 0, 0xC9}, {"no such device", 0, 9, 0xCC}};
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
-    auto const read = fClient.ReadFru(row.offset, 7, row.device);
-    EXPECT_EQ(read.result, kIpmiClientCompletionCode);
-    EXPECT_NE(read.completionCode, 0);
-    EXPECT_NE(read.completionCode, 0xFF);
-    EXPECT_EQ(read.data, "");
+    SCOPED_TRACE(row.fWhat);
+    auto const read = fClient.ReadFru(row.fOffset, 7, row.fDevice);
+    EXPECT_EQ(read.fResult, kIpmiClientCompletionCode);
+    EXPECT_NE(read.fCompletionCode, 0);
+    EXPECT_NE(read.fCompletionCode, 0xFF);
+    EXPECT_EQ(read.fData, "");
   }
-  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345") << "the session continues";
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).fData, "\x07KQ12345") << "the session continues";
 }
 
 TEST_F(IpmiClientTest, AnAnswerMayBeShorterThanRequested) {
   Start();
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
-  EXPECT_EQ(fClient.ReadFru(1024 - 3, 0x1E).data, "\x03\xFF\xFF\xFF");
+  EXPECT_EQ(fClient.ReadFru(1024 - 3, 0x1E).fData, "\x03\xFF\xFF\xFF");
 }
 
 TEST_F(IpmiClientTest, EachReasonForAFailureToOpenHasItsCode) {
   Start();
   struct TRow {
-    char const* what;
-    char const *host, *port, *user, *password;
-    int result;
-    double longestSeconds;
+    char const* fWhat;
+    char const *fHost, *fPort, *fUser, *fPassword;
+    int fResult;
+    double fLongestSeconds;
   };
   std::string const tooLong(21, 'x');
   TRow const rows[] = {
@@ -109,20 +109,20 @@ TEST_F(IpmiClientTest, EachReasonForAFailureToOpenHasItsCode) {
       {"null password", "127.0.0.1", "623", "zepadmin", nullptr, kIpmiClientBadArgument, 3.5},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.what);
+    SCOPED_TRACE(row.fWhat);
     auto const start = TClock::now();
-    EXPECT_EQ(fClient.open(kIpmiClientLan, row.host, row.port, row.user, row.password), row.result);
-    EXPECT_LT(SecondsSince(start), row.longestSeconds);
-    EXPECT_EQ(fClient.ReadFru(0, 1).result, kIpmiClientNoSession);
+    EXPECT_EQ(fClient.fOpen(kIpmiClientLan, row.fHost, row.fPort, row.fUser, row.fPassword), row.fResult);
+    EXPECT_LT(SecondsSince(start), row.fLongestSeconds);
+    EXPECT_EQ(fClient.ReadFru(0, 1).fResult, kIpmiClientNoSession);
   }
   for (int mode : {0, 1, 2, 4, -1})
-    EXPECT_EQ(fClient.open(mode, "127.0.0.1", "623", "zepadmin", "zeppass1"), kIpmiClientBadArgument) << mode;
+    EXPECT_EQ(fClient.fOpen(mode, "127.0.0.1", "623", "zepadmin", "zeppass1"), kIpmiClientBadArgument) << mode;
 }
 
 TEST_F(IpmiClientTest, OtherAccountsOpenAsWell) {
   Start();
-  EXPECT_EQ(fClient.open(kIpmiClientLan, "localhost", "623", "zep16", "abcdefghijklmnop"), kIpmiClientOk);
-  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  EXPECT_EQ(fClient.fOpen(kIpmiClientLan, "localhost", "623", "zep16", "abcdefghijklmnop"), kIpmiClientOk);
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).fData, "\x07KQ12345");
 }
 
 TEST_F(IpmiClientTest, ASilentControllerIsGivenUpAfter7Seconds) {
@@ -139,7 +139,7 @@ TEST_F(IpmiClientTest, ASessionWithASilentControllerIsClosedWithin1500Millisecon
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
   simulator.Stop();
   auto const start = TClock::now();
-  EXPECT_EQ(fClient.close(), kIpmiClientOk);
+  EXPECT_EQ(fClient.fClose(), kIpmiClientOk);
   EXPECT_GT(SecondsSince(start), 1.4);
   EXPECT_LT(SecondsSince(start), 6);
   simulator.GoOn();
@@ -152,8 +152,8 @@ TEST_F(IpmiClientTest, TheNextAddressOfAHostIsTriedAfterASilentOne) {
   ASSERT_EQ(::mount("none", "/", nullptr, MS_REC | MS_PRIVATE, nullptr), 0);
   ASSERT_EQ(::mount(hosts.c_str(), "/etc/hosts", nullptr, MS_BIND, nullptr), 0);
   Start();
-  ASSERT_EQ(fClient.open(kIpmiClientLan, "twohomes", "623", "zepadmin", "zeppass1"), kIpmiClientOk);
-  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  ASSERT_EQ(fClient.fOpen(kIpmiClientLan, "twohomes", "623", "zepadmin", "zeppass1"), kIpmiClientOk);
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).fData, "\x07KQ12345");
 }
 
 TEST_F(IpmiClientTest, GarbageDoesNotOpenASession) {
@@ -181,7 +181,7 @@ TEST_F(IpmiClientTest, ADamagedAnswerIsNeverAccepted) {
   for (int round = 0; round < 3; ++round) {
     auto const start = TClock::now();
     fClient.Open(623);
-    std::string const data = fClient.ReadFru(0x1CC, 7).data;
+    std::string const data = fClient.ReadFru(0x1CC, 7).fData;
     EXPECT_TRUE(data == "" || data == "\x07KQ12345") << data;
     EXPECT_LT(SecondsSince(start), 20);
   }
@@ -192,8 +192,8 @@ TEST_F(IpmiClientTest, OpeningClosesThePreviousSession) {
   Start();
   // The simulator has room for 63 sessions.
   for (int round = 0; round < 70; ++round) ASSERT_EQ(fClient.Open(623), kIpmiClientOk) << round;
-  EXPECT_EQ(fClient.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "wrong"), kIpmiClientWrongPassword);
-  EXPECT_EQ(fClient.ReadFru(0, 1).result, kIpmiClientNoSession) << "also when opening fails";
+  EXPECT_EQ(fClient.fOpen(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "wrong"), kIpmiClientWrongPassword);
+  EXPECT_EQ(fClient.ReadFru(0, 1).fResult, kIpmiClientNoSession) << "also when opening fails";
 }
 
 // A process that keeps a session open until the object is destroyed.
@@ -238,11 +238,11 @@ TEST_F(IpmiClientTest, AControllerWithoutAFreeSessionIsBusy) {
 
 TEST_F(IpmiClientTest, ClosingEndsTheSession) {
   Start();
-  EXPECT_EQ(fClient.close(), 0) << "also without a session";
+  EXPECT_EQ(fClient.fClose(), 0) << "also without a session";
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
-  EXPECT_EQ(fClient.close(), 0);
-  EXPECT_EQ(fClient.ReadFru(0, 1).result, kIpmiClientNoSession);
-  EXPECT_EQ(fClient.close(), 0);
+  EXPECT_EQ(fClient.fClose(), 0);
+  EXPECT_EQ(fClient.ReadFru(0, 1).fResult, kIpmiClientNoSession);
+  EXPECT_EQ(fClient.fClose(), 0);
 }
 
 TEST_F(IpmiClientTest, InvalidArgumentsAreRefused) {
@@ -251,28 +251,28 @@ TEST_F(IpmiClientTest, InvalidArgumentsAreRefused) {
   unsigned char bytes[256] = {};
   unsigned short length = 0;
   unsigned char code = 0xFF;
-  EXPECT_EQ(fClient.send(1, nullptr, 1, bytes, &length, &code, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(fClient.send(1, bytes, -1, bytes, &length, &code, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(fClient.send(1, bytes, 256, bytes, &length, &code, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(fClient.send(1, bytes, 0, nullptr, &length, &code, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(fClient.send(1, bytes, 0, bytes, nullptr, &code, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(fClient.send(1, bytes, 0, bytes, &length, nullptr, 6), kIpmiClientBadArgument);
-  EXPECT_EQ(fClient.send(1, bytes, 0, bytes, &length, &code, 0x1E), kIpmiClientBadArgument) << "a reserved network function";
-  EXPECT_EQ(fClient.send(1, nullptr, 0, bytes, &length, &code, 6), kIpmiClientOk) << "Get Device ID has no data";
+  EXPECT_EQ(fClient.fSend(1, nullptr, 1, bytes, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.fSend(1, bytes, -1, bytes, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.fSend(1, bytes, 256, bytes, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.fSend(1, bytes, 0, nullptr, &length, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.fSend(1, bytes, 0, bytes, nullptr, &code, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.fSend(1, bytes, 0, bytes, &length, nullptr, 6), kIpmiClientBadArgument);
+  EXPECT_EQ(fClient.fSend(1, bytes, 0, bytes, &length, &code, 0x1E), kIpmiClientBadArgument) << "a reserved network function";
+  EXPECT_EQ(fClient.fSend(1, nullptr, 0, bytes, &length, &code, 6), kIpmiClientOk) << "Get Device ID has no data";
   EXPECT_GT(length, 10);
 }
 
 TEST_F(IpmiClientTest, AControllerStoppedDuringASessionIsUsedAgainWhenItContinues) {
   TSimulator const& simulator = Start();
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
-  ASSERT_EQ(fClient.ReadFru(0x1CC, 7).result, kIpmiClientOk);
+  ASSERT_EQ(fClient.ReadFru(0x1CC, 7).fResult, kIpmiClientOk);
   simulator.Stop();
   auto const start = TClock::now();
-  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).result, kIpmiClientNoAnswer);
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).fResult, kIpmiClientNoAnswer);
   EXPECT_GT(SecondsSince(start), 20.9);
   EXPECT_LT(SecondsSince(start), 30);
   simulator.GoOn();
-  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345") << "the next command tries again";
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).fData, "\x07KQ12345") << "the next command tries again";
 }
 
 // ---- A controller with only version 1.5 ----
@@ -288,11 +288,11 @@ TEST_F(IpmiClientTest, AControllerWithOnlyVersion15GetsNoVersion2Packets) {
   });
   auto const start = TClock::now();
   ASSERT_EQ(fClient.Open(623), kIpmiClientOk);
-  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).data, "\x07KQ12345");
+  EXPECT_EQ(fClient.ReadFru(0x1CC, 7).fData, "\x07KQ12345");
   EXPECT_LT(SecondsSince(start), 4);
-  EXPECT_EQ(fClient.open(kIpmiClientLan, "127.0.0.1", "623", "nobody", "zeppass1"), kIpmiClientUnknownUser);
-  EXPECT_EQ(fClient.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "wrong"), kIpmiClientWrongPassword);
-  EXPECT_EQ(fClient.open(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "seventeen letters"), kIpmiClientBadArgument)
+  EXPECT_EQ(fClient.fOpen(kIpmiClientLan, "127.0.0.1", "623", "nobody", "zeppass1"), kIpmiClientUnknownUser);
+  EXPECT_EQ(fClient.fOpen(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "wrong"), kIpmiClientWrongPassword);
+  EXPECT_EQ(fClient.fOpen(kIpmiClientLan, "127.0.0.1", "623", "zepadmin", "seventeen letters"), kIpmiClientBadArgument)
       << "version 1.5 has room for 16";
   EXPECT_EQ(asked2, 0) << "nothing was sent in version 2.0";
 }

@@ -62,7 +62,7 @@ TEST_F(RemoteLibraryTest, ReadsTheIdentityOfTheControllersServer) {
 
 TEST_F(RemoteLibraryTest, DataThatTheControllerRefusesAreNotAvailable) {
   TSimulator::TSettings settings;
-  settings.fru = FruOf(0x1C0);  // ends before the serial number
+  settings.fFru = FruOf(0x1C0);  // ends before the serial number
   TSimulator simulator(settings);
   simulator.WaitUntilReady();
   EXPECT_THAT(IdentityOf("127.0.0.1"), testing::ElementsAre("1234", "AB7", "N/A"));
@@ -70,7 +70,7 @@ TEST_F(RemoteLibraryTest, DataThatTheControllerRefusesAreNotAvailable) {
 
 TEST_F(RemoteLibraryTest, AShortAnswerGivesItsBytes) {
   TSimulator::TSettings settings;
-  settings.fru = FruOf(0x1CC + 3);
+  settings.fFru = FruOf(0x1CC + 3);
   TSimulator simulator(settings);
   simulator.WaitUntilReady();
   EXPECT_EQ(TOSSpecific::GetRemoteMSN("127.0.0.1", "zepadmin", "zeppass1"), "   \0\0\0\0"s);
@@ -137,7 +137,7 @@ TEST_F(ZepRemoteTest, TheReasonOfAMissingSessionIsReported) {
 
 TEST_F(ZepRemoteTest, AMissingPartIsReported) {
   TSimulator::TSettings settings;
-  settings.fru = FruOf(0x1C0);
+  settings.fFru = FruOf(0x1C0);
   TSimulator simulator(settings);
   simulator.WaitUntilReady();
   zep::TRun const run = Run({"127.0.0.1", "--json"});
@@ -150,10 +150,10 @@ TEST_F(ZepRemoteTest, AMissingPartIsReported) {
 
 TEST_F(ZepRemoteTest, UnprogrammedFruDataAreReportedAsSuch) {
   struct TRow {
-    std::size_t erasedFrom, erasedTo;
-    char const *type, *model, *serialNumber;  // null: none
-    int status;
-    char const* error;
+    std::size_t fErasedFrom, fErasedTo;
+    char const *fType, *fModel, *fSerialNumber;  // null: none
+    int fStatus;
+    char const* fError;
   } const rows[] = {
       {0x1AC, 0x200, nullptr, nullptr, nullptr, 1,
        "not programmed in the controller's FRU data (0xFF): machine type, model, serial number"},
@@ -163,20 +163,21 @@ TEST_F(ZepRemoteTest, UnprogrammedFruDataAreReportedAsSuch) {
   };
   auto const orNull = [](char const* text) { return text != nullptr ? nlohmann::json(text) : nlohmann::json(nullptr); };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.erasedFrom);
+    SCOPED_TRACE(row.fErasedFrom);
     TSimulator::TSettings settings;
-    settings.fru = FruOf(0x200);
-    std::string image = ReadFile(settings.fru).replace(0x1CC, 8, "KQ12345\0"s);
-    WriteFile(settings.fru, image.replace(row.erasedFrom, row.erasedTo - row.erasedFrom, row.erasedTo - row.erasedFrom, '\xFF'));
+    settings.fFru = FruOf(0x200);
+    std::string image = ReadFile(settings.fFru).replace(0x1CC, 8, "KQ12345\0"s);
+    WriteFile(settings.fFru,
+              image.replace(row.fErasedFrom, row.fErasedTo - row.fErasedFrom, row.fErasedTo - row.fErasedFrom, '\xFF'));
     TSimulator simulator(settings);
     simulator.WaitUntilReady();
     zep::TRun const run = Run({"127.0.0.1", "--json"});
-    EXPECT_EQ(run.status, row.status);
+    EXPECT_EQ(run.status, row.fStatus);
     auto const document = zep::JsonOf(run);
-    EXPECT_EQ(document["type"], orNull(row.type));
-    EXPECT_EQ(document["model"], orNull(row.model));
-    EXPECT_EQ(document["serialNumber"], orNull(row.serialNumber));
-    EXPECT_EQ(document.value("error", nlohmann::json(nullptr)), orNull(row.error));
+    EXPECT_EQ(document["type"], orNull(row.fType));
+    EXPECT_EQ(document["model"], orNull(row.fModel));
+    EXPECT_EQ(document["serialNumber"], orNull(row.fSerialNumber));
+    EXPECT_EQ(document.value("error", nlohmann::json(nullptr)), orNull(row.fError));
   }
 }
 
@@ -193,11 +194,11 @@ TEST_F(ZepRemoteTest, ThePasswordReachesNeitherOutputNorLog) {
 TEST_F(ZepRemoteTest, AControllerThatAnswersAfter1500MillisecondsIsQueriedWithTheUsualTimeout) {
   constexpr int kControllersPort = 6230;
   TSimulator::TSettings settings;
-  settings.port = kControllersPort;
+  settings.fPort = kControllersPort;
   TSimulator simulator(settings);
   simulator.WaitUntilReady();
   TRelay const relay(623, kControllersPort, [](TRelay::TDatagram const& datagram) {
-    return TRelay::TFate{std::chrono::milliseconds(datagram.isAnswer ? 1500 : 0)};
+    return TRelay::TFate{std::chrono::milliseconds(datagram.fIsAnswer ? 1500 : 0)};
   });
   zep::TRun const run = Run({"127.0.0.1"});
   EXPECT_EQ(run.status, 0) << run.errors;
@@ -220,12 +221,12 @@ TEST_F(ZepRemoteTest, AListOfAThousandHostsIsCompletedAlthoughSomeFail) {
                 "ip addr add 192.0.2.1/24 dev silent0 && ip route add unreachable 198.51.100.0/24"),
             0);
   TSimulator::TSettings settings;
-  settings.address = "0.0.0.0";
+  settings.fAddress = "0.0.0.0";
   TSimulator simulator(settings);  // answers at every address of loopback
   simulator.WaitUntilReady();
   TSimulator::TSettings refusing;
-  refusing.address = "127.2.0.1";
-  refusing.password = "another";
+  refusing.fAddress = "127.2.0.1";
+  refusing.fPassword = "another";
   TSimulator refuser(refusing);
   refuser.WaitUntilReady();
   std::string hosts;

@@ -33,7 +33,7 @@ protected:
   void StartController() {
     fSimulator.reset();
     TSimulator::TSettings settings;
-    settings.port = kControllersPort;
+    settings.fPort = kControllersPort;
     fSimulator.emplace(settings);
     fSimulator->WaitUntilReady();
   }
@@ -43,19 +43,19 @@ protected:
   // Nothing is repeated, however busy this machine is.
   static ipmi::TTimes Patient() {
     ipmi::TTimes times;
-    times.contact = times.step = times.close = ipmi::TWaits(3, 20s);
+    times.fContact = times.fStep = times.fClose = ipmi::TWaits(3, 20s);
     return times;
   }
 
   static ipmi::TTimes IdleSoon(ipmi::TTimes times) {
-    times.idle = 50ms;
+    times.fIdle = 50ms;
     return times;
   }
 
   static void AddEvent(ipmi::TSession& session) {
     session.Send(kStorage, kAddEvent, {0, 0, 2, 0, 0, 0, 0, 0x41, 0, 4, 1, 1, 0x6F, 1, 2, 3});
   }
-  static int Events(ipmi::TSession& session) { return session.Send(kStorage, kEventLogInfo, {}).data.at(1); }
+  static int Events(ipmi::TSession& session) { return session.Send(kStorage, kEventLogInfo, {}).fData.at(1); }
 
   // The requests after the first `count`: "query" for one of version 1.5, otherwise the kind of payload.
   std::vector<std::string> RequestsAfter(std::size_t first) const {
@@ -102,7 +102,7 @@ TEST_F(SessionTest, AControllerThatNeedsTwoSecondsIsNotQueriedAgainMeanwhile) {
   fRelay.reset();
   fRelay.emplace(623, kControllersPort, [](TRelay::TDatagram const& datagram) {
     constexpr unsigned char kProofOfPassword = 0x13;  // RAKP 2
-    bool const isSlow = datagram.isAnswer && datagram.bytes[4] == 6 && (datagram.bytes[5] & 0x3F) == kProofOfPassword;
+    bool const isSlow = datagram.fIsAnswer && datagram.fBytes[4] == 6 && (datagram.fBytes[5] & 0x3F) == kProofOfPassword;
     return isSlow ? TRelay::TFate{2s} : TRelay::AtOnce();
   });
   ipmi::TSession session(Target());
@@ -115,9 +115,9 @@ TEST_F(SessionTest, AControllerThatNeedsTwoSecondsIsNotQueriedAgainMeanwhile) {
 TEST_F(SessionTest, AnOpeningEndsAtItsTimeLimit) {
   fRelay.reset();
   fRelay.emplace(623, kControllersPort,
-                 [](TRelay::TDatagram const& datagram) { return TRelay::TFate{datagram.isAnswer ? 500ms : 0ms}; });
+                 [](TRelay::TDatagram const& datagram) { return TRelay::TFate{datagram.fIsAnswer ? 500ms : 0ms}; });
   ipmi::TTimes times;
-  times.wholeOpening = 1200ms;
+  times.fWholeOpening = 1200ms;
   ipmi::TSession session(Target(), times);
   auto const start = std::chrono::steady_clock::now();
   EXPECT_THROW(session.Open(), ipmi::TFailure);
@@ -128,8 +128,8 @@ TEST_F(SessionTest, AnOpeningEndsAtItsTimeLimit) {
 
 TEST_F(SessionTest, ACommandEndsAtItsTimeLimit) {
   ipmi::TTimes times = Patient();
-  times.command = ipmi::TWaits(3, 20s);
-  times.wholeCommand = 1200ms;
+  times.fCommand = ipmi::TWaits(3, 20s);
+  times.fWholeCommand = 1200ms;
   ipmi::TSession session(Target(), times);
   session.Open();
   fSimulator->Stop();
@@ -143,7 +143,7 @@ TEST_F(SessionTest, ACommandEndsAtItsTimeLimit) {
 TEST_F(SessionTest, AMessageThatIsTooLongForVersion15IsRefusedAndTheSessionContinues) {
   fRelay.reset();
   fRelay.emplace(623, kControllersPort, [](TRelay::TDatagram& datagram) {
-    if (datagram.isAnswer) datagram.bytes = WithoutVersion2(datagram.bytes);
+    if (datagram.fIsAnswer) datagram.fBytes = WithoutVersion2(datagram.fBytes);
     return TRelay::AtOnce();
   });
   ipmi::TSession session(Target());
@@ -159,32 +159,32 @@ TEST_F(SessionTest, AMessageThatIsTooLongForVersion15IsRefusedAndTheSessionConti
 
 TEST(EnvelopeTest, BothCipherSuitesAcceptAMessageAndRefuseADamagedOne) {
   struct TRow {
-    char const* name;
-    ipmi::TCipherSuite suite;
-    unsigned keySize;
+    char const* fName;
+    ipmi::TCipherSuite fSuite;
+    unsigned fKeySize;
   };
   TRow const rows[] = {{"3", {1, 1, 1}, 20}, {"17", {3, 4, 1}, 32}};
   ASSERT_EQ(::ipmi_rmcpplus_init(), 0);
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.name);
+    SCOPED_TRACE(row.fName);
     ipmi::TKeys keys{};
-    keys.size = row.keySize;
-    keys.integrity.fill(1);
-    keys.confidentiality.fill(2);
-    ipmi::TEnvelope2 controllers(row.suite, keys, 1, 2), clients(row.suite, keys, 2, 1);
+    keys.fSize = row.fKeySize;
+    keys.fIntegrity.fill(1);
+    keys.fConfidentiality.fill(2);
+    ipmi::TEnvelope2 controllers(row.fSuite, keys, 1, 2), clients(row.fSuite, keys, 2, 1);
     ipmi::TPacket const packet = controllers.Pack({0x0B, 9, 0x11, {0, 'd', 'a', 't', 'a'}});
     ipmi::TReply reply;
     ASSERT_EQ(clients.Unpack(packet, reply), ipmi::EVerdict::kAnswer);
-    EXPECT_EQ(reply.sequence, 9);
-    EXPECT_EQ(reply.command, 0x11);
-    EXPECT_EQ(reply.data, (ipmi::TByteVector{'d', 'a', 't', 'a'}));
+    EXPECT_EQ(reply.fSequence, 9);
+    EXPECT_EQ(reply.fCommand, 0x11);
+    EXPECT_EQ(reply.fData, (ipmi::TByteVector{'d', 'a', 't', 'a'}));
     clients.Accept(reply);
     EXPECT_EQ(clients.Unpack(packet, reply), ipmi::EVerdict::kOther) << "a copy";
     constexpr std::size_t kFirstSigned = 4;  // after the RMCP header
     for (std::size_t place = kFirstSigned; place < packet.size(); ++place) {
       ipmi::TPacket damaged = packet;
       damaged[place] ^= 1;
-      EXPECT_NE(ipmi::TEnvelope2(row.suite, keys, 2, 1).Unpack(damaged, reply), ipmi::EVerdict::kAnswer) << place;
+      EXPECT_NE(ipmi::TEnvelope2(row.fSuite, keys, 2, 1).Unpack(damaged, reply), ipmi::EVerdict::kAnswer) << place;
     }
   }
 }

@@ -130,7 +130,7 @@ protected:
     std::filesystem::current_path(ZEP_BUILD_DIR "/lib");  // the directory with ovdusblan.so
   }
 
-  static std::string SerialNumberBehindTheSession() { return TIpmiClientLibrary().ReadFru(0x1CC, 7).data; }
+  static std::string SerialNumberBehindTheSession() { return TIpmiClientLibrary().ReadFru(0x1CC, 7).fData; }
 };
 
 TEST_F(NodesTest, TheLinkBringsTheInterfaceUpAndConnects) {

@@ -77,9 +77,9 @@ TEST_F(MediaMountTest, AMountedKeyDoesNotPreventMountingAFloppy) {
 
 TEST_F(MediaMountTest, AFailureToMountThrows) {
   struct TRow {
-    char const* what;
-    std::function<void()> prepare;
-    std::string device;
+    char const* fWhat;
+    std::function<void()> fPrepare;
+    std::string fDevice;
   };
   TRow const rows[] = {
       {"no file system", [] {}, "/dev/null"},
@@ -89,11 +89,11 @@ TEST_F(MediaMountTest, AFailureToMountThrows) {
   };
   for (TRow const& row : rows)
     EXPECT_EQ(WithMountPoints([&] {
-                row.prepare();
-                return StatusOf([&] { TOSSpecific::MountDevice(row.device); });
+                row.fPrepare();
+                return StatusOf([&] { TOSSpecific::MountDevice(row.fDevice); });
               }),
               "kZEPStatusFileSystemError")
-        << row.what;
+        << row.fWhat;
 }
 
 TEST_F(MediaMountTest, ABusyOrUnusedMountPointCannotBeUnmounted) {

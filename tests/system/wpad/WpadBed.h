@@ -42,8 +42,8 @@ protected:
   // Runs the shell command within the namespaces; returns its output and exit status. `settings` are variables for
   // run-in-netns.sh and for the command, such as "WPAD_SERVER=none ".
   struct TRun {
-    int status;
-    std::string output, errors;
+    int fStatus;
+    std::string fOutput, fErrors;
   };
   TRun RunInside(std::string const& settings, std::string const& command) {
     WriteFile(fDir.Path("command"), command);
@@ -57,8 +57,8 @@ protected:
   // The output of a command that must succeed.
   std::string Inside(std::string const& settings, std::string const& command) {
     TRun const run = RunInside(settings, command);
-    EXPECT_EQ(run.status, 0) << run.errors;
-    return run.output;
+    EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+    return run.fOutput;
   }
 
   // A file for the server "bytes".

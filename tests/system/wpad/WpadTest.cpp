@@ -19,9 +19,9 @@ TLines operator+(TLines left, TLines const& right) {
 
 // The output of WpadProbe.
 struct TDiscovery {
-  std::string url;
-  long milliseconds = -1;
-  TLines log;
+  std::string fUrl;
+  long fMilliseconds = -1;
+  TLines fLog;
 };
 
 TLines const kStops = {"[Debug] SpawnProcess: process ps"};
@@ -66,8 +66,8 @@ std::string const kRecorded = "WPAD_SERVER=bytes WPAD_REPLY=" ZEP_TEST_DATA_DIR 
 
 TEST_F(WpadTest, UrlInTheReplyIsReturned) {
   TDiscovery const found = Discover("");
-  EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
-  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kFound);
+  EXPECT_EQ(found.fUrl, "http://wpad.test/wpad.dat");
+  EXPECT_EQ(found.fLog, kStops + kUp + kAsks4 + kFound);
 }
 
 // The shortest of several runs, because other tests may run at the same time. The server replies within two milliseconds.
@@ -82,13 +82,13 @@ TEST_F(WpadTest, DiscoveryEndsWhenTheReplyArrives) {
 
 TEST_F(WpadTest, LongUrlIsReturnedInFull) {
   std::string const url = "http://wpad.test/" + std::string(190, 'x');
-  EXPECT_EQ(Discover("WPAD_URL=" + url).url, url);
+  EXPECT_EQ(Discover("WPAD_URL=" + url).fUrl, url);
 }
 
 TEST_F(WpadTest, ReplyWithoutTheOptionEndsTheQueryWithoutAUrl) {
   TDiscovery const found = DiscoverInHurry("WPAD_URL=-");
-  EXPECT_EQ(found.url, "");
-  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kWaits + kShows);
+  EXPECT_EQ(found.fUrl, "");
+  EXPECT_EQ(found.fLog, kStops + kUp + kAsks4 + kWaits + kShows);
 }
 
 TEST_F(WpadTest, EveryAttemptSendsTheMessageAndTheThirdMayBeAnswered) {
@@ -112,9 +112,9 @@ TEST_F(WpadTest, EveryAttemptSendsTheMessageAndTheThirdMayBeAnswered) {
 
 TEST_F(WpadTest, AnyPacketIsAReply) {
   struct {
-    char const* what;
-    std::string reply;
-    std::string url;
+    char const* fWhat;
+    std::string fReply;
+    std::string fUrl;
   } const rows[] = {
       {"nothing", "", ""},
       {"one byte", "fc", ""},
@@ -126,9 +126,9 @@ TEST_F(WpadTest, AnyPacketIsAReply) {
        "a" + std::string(254, '\0')},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.what);
-    std::string const output = Inside("ZEP_WPAD_HURRY=1 " + ReplyFile(row.reply), "$PROBE start");
-    EXPECT_EQ(output.substr(0, output.find('\n')), row.url);
+    SCOPED_TRACE(row.fWhat);
+    std::string const output = Inside("ZEP_WPAD_HURRY=1 " + ReplyFile(row.fReply), "$PROBE start");
+    EXPECT_EQ(output.substr(0, output.find('\n')), row.fUrl);
     std::size_t const end = output.find("[Debug] receiving  DHCP message error!");
     EXPECT_EQ(end, std::string::npos) << output;
   }
@@ -146,61 +146,61 @@ TEST_F(WpadTest, ReplyToTheSendersPortIsNotReceived) {
 
 TEST_F(WpadTest, UnansweredQueryTakesThreeAttemptsOfSixSeconds) {
   TDiscovery const found = Discover("WPAD_SERVER=none");
-  EXPECT_EQ(found.url, "");
-  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice({"[Debug] receiving  DHCP message error!"}) + kShows);
-  EXPECT_GE(found.milliseconds, 17900);
-  EXPECT_LE(found.milliseconds, 23500);  // the kernel rounds each wait up; a fourth would make it 24 s
+  EXPECT_EQ(found.fUrl, "");
+  EXPECT_EQ(found.fLog, kStops + kUp + kAsks4 + Thrice({"[Debug] receiving  DHCP message error!"}) + kShows);
+  EXPECT_GE(found.fMilliseconds, 17900);
+  EXPECT_LE(found.fMilliseconds, 23500);  // the kernel rounds each wait up; a fourth would make it 24 s
 }
 
 TEST_F(WpadTest, NothingIsSentWithoutARoute) {
-  EXPECT_EQ(DiscoverInHurry("WPAD_ROUTE=none").log, kStops + kUp + kAsks4 + Thrice(kUnsent) + kShows);
+  EXPECT_EQ(DiscoverInHurry("WPAD_ROUTE=none").fLog, kStops + kUp + kAsks4 + Thrice(kUnsent) + kShows);
 }
 
 TEST_F(WpadTest, PortInUseIsRetriedAndThenNoReplyIsReceived) {
   TDiscovery const found = DiscoverInHurry("", R"sh(
     python3 -c 'import socket, time; s = socket.socket(socket.AF_INET, socket.SOCK_DGRAM); s.bind(("", 68)); time.sleep(60)' &
     for _ in $(seq 100); do [ -n "$(ss -Hlnu 'sport = :68')" ] && break; sleep 0.05; done)sh");
-  EXPECT_EQ(found.url, "");
+  EXPECT_EQ(found.fUrl, "");
   TLines const refused = {"[Debug] bind to DHCP_CLIENT_PORT failed!"};
   TLines retries;
   for (int retry = 1; retry <= 10; ++retry) retries = retries + refused + TLines{"[Debug] (up to 3 s)"};
-  EXPECT_EQ(found.log, kStops + kUp + retries + refused + kAsks4 + Thrice(kUnheard) + kShows);
+  EXPECT_EQ(found.fLog, kStops + kUp + retries + refused + kAsks4 + Thrice(kUnheard) + kShows);
 }
 
 // ---- Interfaces ----
 
 TEST_F(WpadTest, SecondInterfaceIsQueriedWhenTheFirstGetsNoReply) {
   TDiscovery const found = DiscoverInHurry("WPAD_FIRST=up WPAD_NAME=eth1");
-  EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
-  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice(kUnheard) + kUp + kAsks4 + kWaits + kFound);
+  EXPECT_EQ(found.fUrl, "http://wpad.test/wpad.dat");
+  EXPECT_EQ(found.fLog, kStops + kUp + kAsks4 + Thrice(kUnheard) + kUp + kAsks4 + kWaits + kFound);
 }
 
 TEST_F(WpadTest, InterfaceThatIsDownIsQueried) {
   TDiscovery const found = DiscoverInHurry("WPAD_FIRST=down WPAD_NAME=eth1");
-  EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
-  EXPECT_EQ(found.log, kStops + kDown + kAsks4 + Thrice(kUnheard) + kUp + kAsks4 + kWaits + kFound);
+  EXPECT_EQ(found.fUrl, "http://wpad.test/wpad.dat");
+  EXPECT_EQ(found.fLog, kStops + kDown + kAsks4 + Thrice(kUnheard) + kUp + kAsks4 + kWaits + kFound);
 }
 
 TEST_F(WpadTest, PromiscuousInterfaceIsLogged) {
-  EXPECT_EQ(Discover("", "ip link set eth0 promisc on").log,
+  EXPECT_EQ(Discover("", "ip link set eth0 promisc on").fLog,
             kStops + TLines{"[Debug] the interface is PROMISC!"} + kUp + kAsks4 + kFound);
 }
 
 TEST_F(WpadTest, InterfaceWithSeveralAddressesIsQueriedOnce) {
-  EXPECT_EQ(DiscoverInHurry("WPAD_SERVER=none", "ip addr add 10.88.0.2/24 dev eth0").log,
+  EXPECT_EQ(DiscoverInHurry("WPAD_SERVER=none", "ip addr add 10.88.0.2/24 dev eth0").fLog,
             kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows);
 }
 
 TEST_F(WpadTest, InterfaceWithAnotherNameIsNotQueried) {
   TDiscovery const found = Discover("WPAD_NAME=net0");
-  EXPECT_EQ(found.url, "");
-  EXPECT_EQ(found.log, kStops + kShows);
+  EXPECT_EQ(found.fUrl, "");
+  EXPECT_EQ(found.fLog, kStops + kShows);
 }
 
 TEST_F(WpadTest, InterfaceThatCannotBeReadIsSkipped) {
   struct {
-    char const* settings;
-    TLines log;
+    char const* fSettings;
+    TLines fLog;
   } const rows[] = {
       {"ZEP_WPAD_FAIL=0x8912", kStops + TLines{"[Debug] cpm: send ioctl error !"} + kShows},
       {"ZEP_WPAD_FAIL=0x8913", kStops + TLines{"[Debug] cpm: ioctl device eth0"} + kShows},
@@ -210,8 +210,8 @@ TEST_F(WpadTest, InterfaceThatCannotBeReadIsSkipped) {
        kStops + kUp + TLines{"[Debug] cpm: ioctl device eth0"} + kUp + kAsks4 + kFound},
   };
   for (auto const& row : rows) {
-    SCOPED_TRACE(row.settings);
-    EXPECT_EQ(Discover(row.settings).log, row.log);
+    SCOPED_TRACE(row.fSettings);
+    EXPECT_EQ(Discover(row.fSettings).fLog, row.fLog);
   }
 }
 
@@ -219,16 +219,16 @@ TEST_F(WpadTest, NothingIsThrownWhenNoSocketCanBeOpened) {
   if (kIsSanitized) GTEST_SKIP() << "a sanitizer needs additional descriptors";
   TLines const noPipe = {"[Debug] ERROR: SpawnProcess - pipe call failed!"};
   TDiscovery const found = Discover("ZEP_WPAD_NO_DESCRIPTORS=1");
-  EXPECT_EQ(found.url, "");
-  EXPECT_EQ(found.log, kStops + noPipe + TLines{"[Debug] cpm: send socket error!"} + kShows + noPipe);
+  EXPECT_EQ(found.fUrl, "");
+  EXPECT_EQ(found.fLog, kStops + noPipe + TLines{"[Debug] cpm: send socket error!"} + kShows + noPipe);
 }
 
 // ---- The query with an IPv6 address ----
 
 TEST_F(WpadTest, IPV6AddressIsFoundInTheOutputOfBusybox) {
   TDiscovery const found = DiscoverInHurry("WPAD_SERVER=none WPAD_IFCONFIG=busybox");
-  EXPECT_EQ(found.url, "");
-  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows + kAsks6 + Thrice(kUnheard));
+  EXPECT_EQ(found.fUrl, "");
+  EXPECT_EQ(found.fLog, kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows + kAsks6 + Thrice(kUnheard));
 }
 
 TEST_F(WpadTest, IPV6QueryHasNoAddressAndTheHardwareAddressReadLast) {
@@ -245,13 +245,13 @@ TEST_F(WpadTest, IPV6QueryHasNoAddressAndTheHardwareAddressReadLast) {
 // The server does not serve any of the queried interfaces. Without an address in the message it replies to the sender.
 TEST_F(WpadTest, IPV6QueryIsAnsweredByARealServer) {
   TDiscovery const found = DiscoverInHurry("WPAD_IFCONFIG=busybox WPAD_FIRST=up WPAD_NAME=net1");
-  EXPECT_EQ(found.url, "http://wpad.test/wpad.dat");
-  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows + kAsks6 + kWaits + kFoundBy6);
+  EXPECT_EQ(found.fUrl, "http://wpad.test/wpad.dat");
+  EXPECT_EQ(found.fLog, kStops + kUp + kAsks4 + Thrice(kUnheard) + kShows + kAsks6 + kWaits + kFoundBy6);
 }
 
 TEST_F(WpadTest, IPV6QueryNeedsNoInterface) {
   TDiscovery const found = DiscoverInHurry("WPAD_IFCONFIG=busybox WPAD_NAME=net0 WPAD_ROUTE=none");
-  EXPECT_EQ(found.log, kStops + kShows + kAsks6 + TLines{"[Debug] invalid MAC Format!"} + Thrice(kUnsent));
+  EXPECT_EQ(found.fLog, kStops + kShows + kAsks6 + TLines{"[Debug] invalid MAC Format!"} + Thrice(kUnsent));
 }
 
 TEST_F(WpadTest, AddressEndsAtItsPrefixLengthOrABlank) {
@@ -262,7 +262,7 @@ TEST_F(WpadTest, AddressEndsAtItsPrefixLengthOrABlank) {
     TDiscovery const found = DiscoverInHurry("WPAD_URL=-", "mkdir /dev/shm/bin; printf '#!/bin/sh\\ncat " + fDir.Path("shown") +
                                                                "' > /dev/shm/bin/ifconfig; chmod +x /dev/shm/bin/ifconfig\n"
                                                                "PATH=/dev/shm/bin:$PATH");
-    EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kWaits + kShows + kAsks6 + kWaits);
+    EXPECT_EQ(found.fLog, kStops + kUp + kAsks4 + kWaits + kShows + kAsks6 + kWaits);
   }
 }
 
@@ -303,7 +303,7 @@ TEST_F(WpadTest, LineWithoutANumberEndsNothing) {
 
 TEST_F(WpadTest, MissingProgramsEndNothingAndShowNoAddress) {
   TDiscovery const found = Discover("WPAD_DHCLIENT=1 WPAD_URL=-", "PATH=/nowhere");
-  EXPECT_EQ(found.log, kStops + kUp + kAsks4 + kShows);
+  EXPECT_EQ(found.fLog, kStops + kUp + kAsks4 + kShows);
 }
 
 }  // namespace

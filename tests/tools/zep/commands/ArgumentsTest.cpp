@@ -31,8 +31,8 @@ protected:
 
 TEST_F(ArgumentsTest, WrongUsageIsReportedWithoutRepeatingTheArguments) {
   struct TRow {
-    std::vector<std::string> arguments;
-    std::string errors;
+    std::vector<std::string> fArguments;
+    std::string fErrors;
   };
   TRow const rows[] = {
       {{"remote", "h", "--user", "u", "--password", "SECRET1"}, "there is no option --password"},
@@ -60,7 +60,7 @@ TEST_F(ArgumentsTest, WrongUsageIsReportedWithoutRepeatingTheArguments) {
       {{"media", "SECRET1"}, "there is no such command"},
       {{"media", "mount", "/dev/sdz", "SECRET1"}, "there is one argument too many"},
   };
-  for (TRow const& row : rows) ExpectWrongUsage(row.arguments, row.errors);
+  for (TRow const& row : rows) ExpectWrongUsage(row.fArguments, row.fErrors);
 }
 
 TEST_F(ArgumentsTest, UnknownCommandIsNamed) {
@@ -88,8 +88,8 @@ TEST_F(ArgumentsTest, ArgumentsAreEscapedInMessages) {
 
 TEST_F(ArgumentsTest, EmptyArgumentsAreRefused) {
   struct TRow {
-    std::vector<std::string> arguments;
-    std::string name;
+    std::vector<std::string> fArguments;
+    std::string fName;
   };
   TRow const rows[] = {
       {{"report", "--send", ""}, "--send"},
@@ -117,7 +117,7 @@ TEST_F(ArgumentsTest, EmptyArgumentsAreRefused) {
       {{"get", "ftp://h/f", ""}, "file"},
       {{"proxy-check", ""}, "proxy"},
   };
-  for (TRow const& row : rows) ExpectWrongUsage(row.arguments, row.name + " must not be empty");
+  for (TRow const& row : rows) ExpectWrongUsage(row.fArguments, row.fName + " must not be empty");
 }
 
 TEST_F(ArgumentsTest, HelpThatCannotBeWrittenIsAFailure) {

@@ -14,9 +14,9 @@ namespace {
 
 // A call with --json, and its exit status.
 struct TRow {
-  std::string document;
-  int status;
-  std::vector<std::string> arguments;
+  std::string fDocument;
+  int fStatus;
+  std::vector<std::string> fArguments;
 };
 
 class EnvelopeTest : public testing::Test {
@@ -43,10 +43,10 @@ protected:
   }
 
   void Expect(TRow const& row) {
-    SCOPED_TRACE(testing::PrintToString(row.arguments));
-    TRun const run = Run(row.arguments);
-    EXPECT_EQ(run.status, row.status) << run.errors;
-    ExpectEnvelope(run.output, run.status, row.document);
+    SCOPED_TRACE(testing::PrintToString(row.fArguments));
+    TRun const run = Run(row.fArguments);
+    EXPECT_EQ(run.status, row.fStatus) << run.errors;
+    ExpectEnvelope(run.output, run.status, row.fDocument);
   }
 
   // The names below "Subcommands:", each after the name of its command.
@@ -90,7 +90,7 @@ protected:
     EXPECT_GT(commands.size(), 10u) << "the list of zep --help should be parsed completely";
     std::set<std::string> missing = commands;
     for (std::string const& other : others) missing.erase(other);
-    for (TRow const& row : rows) missing.erase(CommandOf(commands, row.arguments));
+    for (TRow const& row : rows) missing.erase(CommandOf(commands, row.fArguments));
     return missing;
   }
 

@@ -104,8 +104,8 @@ protected:
 
 TEST_F(ReportTest, TheMachineOfEachRealTableIsReported) {
   struct TRow {
-    char const *table, *machine;
-    int status;
+    char const *fTable, *fMachine;
+    int fStatus;
   } const rows[] = {
       {"full", "db1: Server Q100, type 1234, model AB7, serial number KQ12345", 0},
       {"bare7", "db1: 1234AB7, type 1234, model AB7, serial number KQ12345", 0},
@@ -116,21 +116,21 @@ TEST_F(ReportTest, TheMachineOfEachRealTableIsReported) {
       {"entry64", "db1: Server Q100, type 1234, model AB7, serial number KQ12345", 0},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.table);
-    TRun const run = Report(RealTablePath(row.table));
-    EXPECT_EQ(run.status, row.status);
+    SCOPED_TRACE(row.fTable);
+    TRun const run = Report(RealTablePath(row.fTable));
+    EXPECT_EQ(run.status, row.fStatus);
     EXPECT_EQ(run.errors, "");
     auto const lines = LinesOf(run.output);
     ASSERT_GT(lines.size(), 3u);
-    EXPECT_EQ(lines[0], row.machine);
+    EXPECT_EQ(lines[0], row.fMachine);
     EXPECT_THAT(lines[1], AllOf(StartsWith("Operating system: "), HasSubstr(", Linux ")));
-    EXPECT_EQ(lines[2], "SMBIOS tables read from the file " + RealTablePath(row.table) + " (ZEP_SMBIOS_TABLE)");
+    EXPECT_EQ(lines[2], "SMBIOS tables read from the file " + RealTablePath(row.fTable) + " (ZEP_SMBIOS_TABLE)");
   }
 }
 
 TEST_F(ReportTest, EachRowHasItsValueOrItsReason) {
   struct TRow {
-    char const *table, *label, *value;
+    char const *fTable, *fLabel, *fValue;
   } const rows[] = {
       {"full", "Host name", "db1"},
       {"full", "Product name", "Server Q100 -[1234AB7]-"},
@@ -153,7 +153,7 @@ TEST_F(ReportTest, EachRowHasItsValueOrItsReason) {
       {"no-serial", "Serial number", "unknown: not given by the firmware"},
       {"two-dashes", "Serial number", "KQ 99 (not in the collector's own form: 7 letters and digits)"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(ValueIn(Report(RealTablePath(row.table)).output, row.label), row.value) << row.table;
+  for (TRow const& row : rows) EXPECT_EQ(ValueIn(Report(RealTablePath(row.fTable)).output, row.fLabel), row.fValue) << row.fTable;
 }
 
 TEST_F(ReportTest, AProductNameWithoutModelIsReportedAsSuch) {
@@ -169,8 +169,8 @@ TEST_F(ReportTest, SerialNumbersOfAllManufacturersAreShownAndCompleteTheIdentity
   std::string const longest = "XVM-42 1f 9a 3c 5d 7e 80 21-b3 c4 d5 e6 f7 08 19 2a 3b";
   ASSERT_EQ(longest.size(), 54u);
   struct TRow {
-    std::string productName, serialNumber, shownSerialNumber;
-    bool isOfOwnForm;
+    std::string fProductName, fSerialNumber, fShownSerialNumber;
+    bool fIsOfOwnForm;
   } const rows[] = {
       {"Rackhost R5200", "E09626824801435", "E09626824801435", false},
       {"Rackhost R5200 Gen3", "9000116105", "9000116105", false},
@@ -187,23 +187,23 @@ TEST_F(ReportTest, SerialNumbersOfAllManufacturersAreShownAndCompleteTheIdentity
       {"Tower P110", "KQ12345", "KQ12345", true},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.serialNumber);
-    std::string const table = fZep.Table(SystemInformation(row.productName, row.serialNumber) + EndOfTable());
+    SCOPED_TRACE(row.fSerialNumber);
+    std::string const table = fZep.Table(SystemInformation(row.fProductName, row.fSerialNumber) + EndOfTable());
     std::string const note = "not in the collector's own form: 7 letters and digits";
     TRun const text = Report(table);
     EXPECT_EQ(text.status, 0);
     EXPECT_EQ(LinesOf(text.output)[0],
-              "db1: " + row.productName + ", no machine type and model, serial number " + row.shownSerialNumber);
+              "db1: " + row.fProductName + ", no machine type and model, serial number " + row.fShownSerialNumber);
     EXPECT_EQ(WithoutBlanks(ValueIn(text.output, "Serial number")),
-              WithoutBlanks(row.shownSerialNumber + (row.isOfOwnForm ? "" : " (" + note + ")")));
+              WithoutBlanks(row.fShownSerialNumber + (row.fIsOfOwnForm ? "" : " (" + note + ")")));
 
     TRun const json = Report(table, {"--json"});
     EXPECT_EQ(json.status, 0);
     auto const document = JsonOf(json);
     EXPECT_EQ(document["status"], "complete");
     auto const& serialNumber = document["identity"]["serialNumber"];
-    EXPECT_EQ(serialNumber["value"], row.shownSerialNumber);
-    EXPECT_EQ(serialNumber.value("note", ""), row.isOfOwnForm ? "" : note);
+    EXPECT_EQ(serialNumber["value"], row.fShownSerialNumber);
+    EXPECT_EQ(serialNumber.value("note", ""), row.fIsOfOwnForm ? "" : note);
     EXPECT_FALSE(serialNumber.contains("code"));
     for (char const* key : {"machineType", "model"}) {
       EXPECT_TRUE(document["identity"][key]["value"].is_null());
@@ -222,8 +222,8 @@ TEST_F(ReportTest, ASerialNumberOfAnotherFormCompletesTheIdentity) {
 
 TEST_F(ReportTest, OnlyAProductNameWithoutBracketsHasNoTypeAndModel) {
   struct TRow {
-    char const *productName, *machine, *typeCode, *modelCode;  // the code is null for a value
-    int status;
+    char const *fProductName, *fMachine, *fTypeCode, *fModelCode;  // the code is null for a value
+    int fStatus;
   } const rows[] = {
       {"Server Q100 -[1234]-", "Server Q100, type 1234, model unknown", nullptr, "not-given", 2},
       {"Server Q100 -[12]-", "Server Q100, type unknown, model unknown", "unexpected-form", "unexpected-form", 2},
@@ -235,13 +235,13 @@ TEST_F(ReportTest, OnlyAProductNameWithoutBracketsHasNoTypeAndModel) {
       {"None", "unknown product, type unknown, model unknown", "placeholder", "placeholder", 2},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.productName);
-    std::string const table = fZep.Table(SystemInformation(row.productName, "KQ12345") + EndOfTable());
+    SCOPED_TRACE(row.fProductName);
+    std::string const table = fZep.Table(SystemInformation(row.fProductName, "KQ12345") + EndOfTable());
     TRun const run = Report(table, {"--json"});
-    EXPECT_EQ(run.status, row.status);
+    EXPECT_EQ(run.status, row.fStatus);
     auto const document = JsonOf(run);
-    EXPECT_EQ(document["head"][0], "db1: " + std::string(row.machine) + ", serial number KQ12345");
-    for (auto const& [key, code] : {std::pair("machineType", row.typeCode), std::pair("model", row.modelCode)}) {
+    EXPECT_EQ(document["head"][0], "db1: " + std::string(row.fMachine) + ", serial number KQ12345");
+    for (auto const& [key, code] : {std::pair("machineType", row.fTypeCode), std::pair("model", row.fModelCode)}) {
       auto const& entry = document["identity"][key];
       EXPECT_EQ(entry.value("code", ""), code != nullptr ? code : "") << key;
       EXPECT_EQ(entry["value"].is_null(), code != nullptr) << key;
@@ -259,15 +259,15 @@ TEST_F(ReportTest, PlaceholdersOfTheFirmwareAreReportedAsSuch) {
 
 TEST_F(ReportTest, ASerialNumberThatWasNeverWrittenIsMissing) {
   struct TRow {
-    char const *serialNumber, *code, *shown;
+    char const *fSerialNumber, *fCode, *fShown;
   } const rows[] = {
       {"\xff\xff\xff\xff\xff\xff\xff ", "not-given", "unknown: not programmed in the firmware's table (0xFF)"},
       {" - ", "placeholder", "unknown: placeholder text of the firmware: \" - \""},
   };
   for (TRow const& row : rows) {
-    std::string const table = fZep.Table(SystemInformation("Rackhost R5200", row.serialNumber) + EndOfTable());
-    EXPECT_EQ(JsonOf(Report(table, {"--json"}))["identity"]["serialNumber"]["code"], row.code);
-    EXPECT_EQ(WithoutBlanks(ValueIn(Report(table).output, "Serial number")), WithoutBlanks(row.shown));
+    std::string const table = fZep.Table(SystemInformation("Rackhost R5200", row.fSerialNumber) + EndOfTable());
+    EXPECT_EQ(JsonOf(Report(table, {"--json"}))["identity"]["serialNumber"]["code"], row.fCode);
+    EXPECT_EQ(WithoutBlanks(ValueIn(Report(table).output, "Serial number")), WithoutBlanks(row.fShown));
   }
 }
 
@@ -313,20 +313,20 @@ TEST_F(ReportTest, ATableFileOfAnotherUserHasAReason) {
 TEST_F(ReportTest, UnreadableSystemTablesHaveAReason) {
   fZep.Add("libsmbios.so", FAKE_SMBIOS);
   struct TRow {
-    char const *behaviour, *machine, *code;
+    char const *fBehaviour, *fMachine, *fCode;
   } const rows[] = {
       {"is missing its file", "db1: not identified: no SMBIOS tables exported", "no-smbios"},
       {"is denied access", "db1: not identified: needs root (SMBIOS tables)", "needs-root"},
       {"fails", "db1: not identified: the system's SMBIOS tables cannot be read", "unreadable"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.behaviour);
-    TRun const run = Run({}, {{"FAKE_SMBIOS", row.behaviour}});
+    SCOPED_TRACE(row.fBehaviour);
+    TRun const run = Run({}, {{"FAKE_SMBIOS", row.fBehaviour}});
     EXPECT_EQ(run.status, 2);
-    EXPECT_EQ(LinesOf(run.output)[0], row.machine);
-    auto const identity = JsonOf(Run({"--json"}, {{"FAKE_SMBIOS", row.behaviour}}))["identity"];
+    EXPECT_EQ(LinesOf(run.output)[0], row.fMachine);
+    auto const identity = JsonOf(Run({"--json"}, {{"FAKE_SMBIOS", row.fBehaviour}}))["identity"];
     for (char const* key : {"productName", "machineType", "model", "serialNumber"}) {
-      EXPECT_EQ(identity[key]["code"], row.code) << key;
+      EXPECT_EQ(identity[key]["code"], row.fCode) << key;
       EXPECT_TRUE(identity[key]["value"].is_null()) << key;
     }
     EXPECT_EQ(identity["hostName"]["value"], "db1");
@@ -534,7 +534,7 @@ TEST_F(ReportTest, ABrokenPlugInAloneReportsNothing) {
 
 TEST_F(ReportTest, AProviderThatFailsIsReportedAndStopsNoOther) {
   struct TRow {
-    char const *behaviour, *result;
+    char const *fBehaviour, *fResult;
   } const rows[] = {
       {"throws", "provider Test failed: kZEPStatusAccessDenied"},
       {"throws-a-number", "provider Test failed: it threw something that is not a std::exception"},
@@ -542,16 +542,16 @@ TEST_F(ReportTest, AProviderThatFailsIsReportedAndStopsNoOther) {
       {"fails-at-once", "provider Test failed: kZEPStatusFail"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.behaviour);
-    TRun const run = RunWithTestProvider(row.behaviour);
+    SCOPED_TRACE(row.fBehaviour);
+    TRun const run = RunWithTestProvider(row.fBehaviour);
     EXPECT_EQ(run.status, 2);
     EXPECT_EQ(LinesOf(run.output)[0], "db1: Server Q100, type 1234, model AB7, serial number KQ12345");
     auto const plugIns = PlugInRowsOf(run.output);
     ASSERT_EQ(plugIns.size(), 2u);
     EXPECT_EQ(plugIns[1][0], "Test");
-    EXPECT_EQ(plugIns[1][2], row.result);
-    auto const provider = JsonOf(RunWithTestProvider(row.behaviour, {"--json"}))["plugIns"][1]["providers"][0];
-    EXPECT_EQ("provider Test failed: " + provider["error"].get<std::string>(), row.result);
+    EXPECT_EQ(plugIns[1][2], row.fResult);
+    auto const provider = JsonOf(RunWithTestProvider(row.fBehaviour, {"--json"}))["plugIns"][1]["providers"][0];
+    EXPECT_EQ("provider Test failed: " + provider["error"].get<std::string>(), row.fResult);
     EXPECT_TRUE(provider["namespace"].is_null());
   }
 }
@@ -722,8 +722,8 @@ TEST_F(ReportTest, HelpAndVersionArePrinted) {
   EXPECT_EQ(version.status, 0);
   EXPECT_EQ(version.output, "zep " TEST_VERSION " (build " TEST_BUILD_ID ")\n");
   struct TRow {
-    std::vector<std::string> arguments;
-    std::vector<char const*> words;
+    std::vector<std::string> fArguments;
+    std::vector<char const*> fWords;
   } const rows[] = {
       {{"--help"}, {"report", "show", "--version"}},
       {{"-h"}, {"report", "show"}},
@@ -731,13 +731,13 @@ TEST_F(ReportTest, HelpAndVersionArePrinted) {
       {{"show", "--help"}, {"path", "--json", "--sample", "Exit status"}},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(testing::PrintToString(row.arguments));
+    SCOPED_TRACE(testing::PrintToString(row.fArguments));
     TCall call;
-    call.arguments = row.arguments;
+    call.arguments = row.fArguments;
     TRun const run = fZep.Run(call);
     EXPECT_EQ(run.status, 0);
     EXPECT_EQ(run.errors, "");
-    for (char const* word : row.words) EXPECT_THAT(run.output, HasSubstr(word));
+    for (char const* word : row.fWords) EXPECT_THAT(run.output, HasSubstr(word));
   }
 }
 

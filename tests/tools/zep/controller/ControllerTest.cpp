@@ -47,7 +47,7 @@ TEST(RemoteIdentityTextTest, IsReadFromTheTextThatTheProcessSent) {
 
 TEST(RemoteIdentityTextTest, FieldsSentByAProcessThatDidNotFinishAreKept) {
   struct {
-    std::string sent, type, model, serialNumber;
+    std::string fSent, fType, fModel, fSerialNumber;
   } const rows[] = {
       {"", "", "", ""},
       {"12", "", "", ""},  // a field without its end may be truncated
@@ -56,10 +56,10 @@ TEST(RemoteIdentityTextTest, FieldsSentByAProcessThatDidNotFinishAreKept) {
       {kSaid, "1234", "AB7", "KQ12345"},
   };
   for (auto const& row : rows) {
-    TRemoteIdentity const identity = IdentityFrom("h", row.sent, false);
-    EXPECT_EQ(identity.fType, row.type);
-    EXPECT_EQ(identity.fModel, row.model);
-    EXPECT_EQ(identity.fSerialNumber, row.serialNumber);
+    TRemoteIdentity const identity = IdentityFrom("h", row.fSent, false);
+    EXPECT_EQ(identity.fType, row.fType);
+    EXPECT_EQ(identity.fModel, row.fModel);
+    EXPECT_EQ(identity.fSerialNumber, row.fSerialNumber);
     EXPECT_EQ(identity.fError, "the process that queried the controller ended before it was done");
   }
 }
@@ -155,13 +155,13 @@ TEST_F(ZepRemoteTest, AFileOfHostsThatCannotBeUsedIsReported) {
 
 TEST_F(ZepRemoteTest, AReadErrorInTheFileOfHostsIsNotTheEndOfTheFile) {
   struct TRow {
-    std::string path, reason;
+    std::string fPath, fReason;
   };
   for (TRow const& row : {TRow{fZep.Path("lib"), "Is a directory"}, TRow{"/proc/self/mem", "Input/output error"}}) {
-    TRun const run = Run({"--hosts", row.path, "--user", "u"}, fPassword);
+    TRun const run = Run({"--hosts", row.fPath, "--user", "u"}, fPassword);
     EXPECT_EQ(run.status, 1);
     EXPECT_EQ(run.output, "");
-    EXPECT_EQ(run.errors, "zep: " + row.path + " cannot be read: " + row.reason + "\n");
+    EXPECT_EQ(run.errors, "zep: " + row.fPath + " cannot be read: " + row.fReason + "\n");
   }
 }
 
@@ -207,13 +207,13 @@ TEST_F(ZepRemoteTest, ADebugLogMustBeARegularFileOfTheCaller) {
   fs::create_hard_link(victim, fZep.Path("second"));
   ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
   struct TRow {
-    std::string log, reason;
+    std::string fLog, fReason;
   };
   for (TRow const& row : {TRow{link, "it is a symbolic link"}, TRow{fZep.Path("second"), "it has several names (hard links)"},
                           TRow{fifo, "it is not a regular file"}, TRow{"/dev/null", "it is not a regular file"}}) {
-    TRun const run = Run({"host", "--user", "u", "--debug-log", row.log}, fPassword);
+    TRun const run = Run({"host", "--user", "u", "--debug-log", row.fLog}, fPassword);
     EXPECT_EQ(run.status, 1);
-    EXPECT_EQ(run.errors, "zep: the debug log " + row.log + " cannot be written: " + row.reason + "\n");
+    EXPECT_EQ(run.errors, "zep: the debug log " + row.fLog + " cannot be written: " + row.fReason + "\n");
   }
   EXPECT_EQ(ReadFile(victim), "untouched");
 }
@@ -333,7 +333,7 @@ TEST_F(ZepRemoteTest, ADebugLogThatCannotBeWrittenIsReported) {
 TEST_F(ZepRemoteTest, EachErrorOfTheClientLibraryHasItsReason) {
   fZep.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
   struct TRow {
-    char const *code, *words;
+    char const *fCode, *fWords;
   } const rows[] = {
       {"1", "wrong password"},
       {"2", "unknown user, or the account is disabled"},
@@ -353,12 +353,12 @@ TEST_F(ZepRemoteTest, EachErrorOfTheClientLibraryHasItsReason) {
   };
   std::string const log = fZep.Path("log");
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.code);
+    SCOPED_TRACE(row.fCode);
     auto environment = fPassword;
-    environment["FAKE_IPMI_CODE"] = row.code;
+    environment["FAKE_IPMI_CODE"] = row.fCode;
     TRun const run = Run({"host", "--user", "u"}, environment);
     EXPECT_EQ(run.status, 1);
-    EXPECT_EQ(run.errors, "zep: host: no session with the controller after N s: "s + row.words + "\n");
+    EXPECT_EQ(run.errors, "zep: host: no session with the controller after N s: "s + row.fWords + "\n");
     TRun const logged = Run({"host", "--user", "u", "--debug-log", log}, environment);
     EXPECT_THAT(logged.errors, testing::EndsWith(run.errors));
     EXPECT_EQ((logged.output + logged.errors + ReadFile(log)).find("zeppass1"), std::string::npos);
@@ -392,8 +392,8 @@ TEST_F(ZepRemoteTest, ASessionWithoutAnswersIsReported) {
 // ---- At a terminal ----
 
 struct TSession {
-  int status;
-  std::string shown;
+  int fStatus;
+  std::string fShown;
 };
 
 // Runs zep at a new terminal and types the text at the first prompt.
@@ -410,36 +410,36 @@ TSession TypeAt(TInstallation const& zep, std::string const& typed) {
   bool isTyped = false;
   char chunk[512];
   for (ssize_t got = 0; (got = ::read(terminal, chunk, sizeof chunk)) > 0;) {
-    session.shown.append(chunk, static_cast<std::size_t>(got));
-    if (isTyped || session.shown.find(": ") == std::string::npos) continue;
+    session.fShown.append(chunk, static_cast<std::size_t>(got));
+    if (isTyped || session.fShown.find(": ") == std::string::npos) continue;
     isTyped = ::write(terminal, typed.data(), typed.size()) == static_cast<ssize_t>(typed.size());
   }
   int status = 0;
   ::waitpid(child, &status, 0);
-  session.shown = WithoutSeconds(session.shown);
-  session.status = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
+  session.fShown = WithoutSeconds(session.fShown);
+  session.fStatus = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
   ::close(terminal);
   return session;
 }
 
 TEST_F(ZepRemoteTest, ThePasswordIsReadWithoutEcho) {
   TSession const session = TypeAt(fZep, "zeppass1\n");
-  EXPECT_EQ(session.status, 1);
-  EXPECT_THAT(session.shown, testing::StartsWith("Password of zepadmin: \r\nRemote server"));
-  EXPECT_THAT(session.shown, HasSubstr("zep: host: " + kNothing));
-  EXPECT_EQ(session.shown.find("zeppass1"), std::string::npos);
+  EXPECT_EQ(session.fStatus, 1);
+  EXPECT_THAT(session.fShown, testing::StartsWith("Password of zepadmin: \r\nRemote server"));
+  EXPECT_THAT(session.fShown, HasSubstr("zep: host: " + kNothing));
+  EXPECT_EQ(session.fShown.find("zeppass1"), std::string::npos);
 }
 
 TEST_F(ZepRemoteTest, AnInterruptAtThePasswordPromptEndsZep) {
   TSession const session = TypeAt(fZep, "zepp\x03");
-  EXPECT_EQ(session.status, 128 + SIGINT);
-  EXPECT_EQ(session.shown, "Password of zepadmin: \r\n");
+  EXPECT_EQ(session.fStatus, 128 + SIGINT);
+  EXPECT_EQ(session.fShown, "Password of zepadmin: \r\n");
 }
 
 TEST_F(ZepRemoteTest, WithoutAPasswordNoControllerIsQueried) {
   TSession const session = TypeAt(fZep, "\x04");
-  EXPECT_EQ(session.status, 1);
-  EXPECT_EQ(session.shown, "Password of zepadmin: \r\nzep: no password was given\r\n");
+  EXPECT_EQ(session.fStatus, 1);
+  EXPECT_EQ(session.fShown, "Password of zepadmin: \r\nzep: no password was given\r\n");
 }
 
 }  // namespace

@@ -36,7 +36,7 @@ TEST(MediaTest, APlainPathHasNoCharacterThatTheShellInterprets) {
 
 TEST(MediaTest, TrailingSlashesAreStripped) {
   struct TRow {
-    char const *name, *stripped;
+    char const *fName, *fStripped;
   };
   TRow const rows[] = {{"/mnt/key", "/mnt/key"},
                        {"/mnt/key/", "/mnt/key"},
@@ -45,7 +45,7 @@ TEST(MediaTest, TrailingSlashesAreStripped) {
                        {"/", "/"},
                        {"//", "/"},
                        {"", ""}};
-  for (TRow const& row : rows) EXPECT_EQ(WithoutTrailingSlashes(row.name), row.stripped) << row.name;
+  for (TRow const& row : rows) EXPECT_EQ(WithoutTrailingSlashes(row.fName), row.fStripped) << row.fName;
 }
 
 TEST(MediaTest, ADeviceMustExistBelowDev) {
@@ -85,8 +85,8 @@ TEST(MediaTest, RemovableDrivesAndTheirPartitionsAreMedia) {
 
 TEST(MediaTest, RemovableDrivesAndUsbDrivesAreListed) {
   struct TRow {
-    char const* fields;
-    bool isMedium;
+    char const* fFields;
+    bool fIsMedium;
   };
   TRow const rows[] = {
       {R"("type":"disk","rm":true,"tran":null)", true},
@@ -98,9 +98,9 @@ TEST(MediaTest, RemovableDrivesAndUsbDrivesAreListed) {
       {R"("rm":true)", false},
   };
   for (TRow const& row : rows)
-    EXPECT_EQ(MediaIn(std::string("{\"blockdevices\":[{\"name\":\"/dev/x\",") + row.fields + "}]}").size(),
-              row.isMedium ? 1u : 0u)
-        << row.fields;
+    EXPECT_EQ(MediaIn(std::string("{\"blockdevices\":[{\"name\":\"/dev/x\",") + row.fFields + "}]}").size(),
+              row.fIsMedium ? 1u : 0u)
+        << row.fFields;
 }
 
 TEST(MediaTest, EachPartitionIsListedSeparately) {
@@ -164,9 +164,9 @@ TEST(MediaTest, AMountIsFoundByItsCompleteMountPoint) {
       "44 43 7:5 / /mnt/floppy rw - ext4 /dev/loop5 rw\n"
       "broken\n";
   struct TRow {
-    char const *directory, *source;
-    unsigned major, minor;
-    bool isReadOnly;
+    char const *fDirectory, *fSource;
+    unsigned fMajor, fMinor;
+    bool fIsReadOnly;
   };
   TRow const rows[] = {
       {"/mnt/key", "/dev/sdb1", 8, 17, false},
@@ -175,12 +175,12 @@ TEST(MediaTest, AMountIsFoundByItsCompleteMountPoint) {
       {"/mnt/floppy", "/dev/loop5", 7, 5, false},  // the later mount is on top
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.directory);
-    auto const mount = MountIn(info, row.directory);
+    SCOPED_TRACE(row.fDirectory);
+    auto const mount = MountIn(info, row.fDirectory);
     ASSERT_TRUE(mount);
-    EXPECT_EQ(mount->fSource, row.source);
-    EXPECT_EQ(mount->fDevice, ::gnu_dev_makedev(row.major, row.minor));
-    EXPECT_EQ(mount->fIsReadOnly, row.isReadOnly);
+    EXPECT_EQ(mount->fSource, row.fSource);
+    EXPECT_EQ(mount->fDevice, ::gnu_dev_makedev(row.fMajor, row.fMinor));
+    EXPECT_EQ(mount->fIsReadOnly, row.fIsReadOnly);
   }
   for (char const* directory : {"/mnt", "/mnt/ke", "/mnt/key/", "/", "", "broken"})
     EXPECT_FALSE(MountIn(info, directory)) << directory;
@@ -238,7 +238,7 @@ TEST_F(MediaCommandTest, ListsMediaAsATable) {
 
 TEST_F(MediaCommandTest, TheTableShowsSizesAndMountPoints) {
   struct TRow {
-    std::string size, shown;
+    std::string fSize, fShown;
   };
   TRow const rows[] = {
       {"512", "512 B"},          {"1024", "1 KiB"},       {"1536", "1.5 KiB"},         {"7864320", "7.5 MiB"},
@@ -246,13 +246,13 @@ TEST_F(MediaCommandTest, TheTableShowsSizesAndMountPoints) {
   std::string list;
   for (TRow const& row : rows)
     list += std::string(list.empty() ? "" : ",") + R"({"name":"/dev/sdb","type":"disk","rm":true,"model":"Key","size":)" +
-            row.size + R"(,"mountpoints":["/mnt/key","/media/a"]})";
+            row.fSize + R"(,"mountpoints":["/mnt/key","/media/a"]})";
   AddStandIn("lsblk", "echo '{\"blockdevices\":[" + list + "]}'");
   AddStandIn("blkid", "exit 2");
   std::vector<std::string> const lines = LinesOf(Run({}).output);
   ASSERT_EQ(lines.size(), 1 + 2 * std::size(rows));
   for (std::size_t i = 0; i < std::size(rows); ++i) {
-    std::string const size = rows[i].shown + std::string(11 - rows[i].shown.size(), ' ');
+    std::string const size = rows[i].fShown + std::string(11 - rows[i].fShown.size(), ' ');
     EXPECT_EQ(lines[1 + 2 * i], "/dev/sdb      " + size + "-            -            /mnt/key      Key");
     EXPECT_EQ(lines[2 + 2 * i], std::string(51, ' ') + "/media/a");
   }
@@ -311,9 +311,9 @@ TEST_F(MediaCommandTest, UnreadableLabelsAreReported) {
 TEST_F(MediaCommandTest, InvalidNamesAreRefusedBeforeAnyProgramRuns) {
   for (char const* program : {"mount", "umount"}) AddStandIn(program, "echo run >> " + fInstallation.Path("run"));
   struct TRow {
-    std::vector<std::string> arguments;
-    int status;
-    char const* errors;
+    std::vector<std::string> fArguments;
+    int fStatus;
+    char const* fErrors;
   };
   TRow const rows[] = {
       {{"mount", "/dev/sdb;reboot"}, 64, "zep: \"/dev/sdb;reboot\" is not a device name"},
@@ -333,10 +333,10 @@ TEST_F(MediaCommandTest, InvalidNamesAreRefusedBeforeAnyProgramRuns) {
       {{"eject"}, 64, "zep: there is no command \"eject\""},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(testing::PrintToString(row.arguments));
-    TRun const run = Run(row.arguments);
-    EXPECT_EQ(run.status, row.status);
-    EXPECT_THAT(run.errors, StartsWith(row.errors));
+    SCOPED_TRACE(testing::PrintToString(row.fArguments));
+    TRun const run = Run(row.fArguments);
+    EXPECT_EQ(run.status, row.fStatus);
+    EXPECT_THAT(run.errors, StartsWith(row.fErrors));
     EXPECT_EQ(run.output, "");
   }
   EXPECT_FALSE(fs::exists(fInstallation.Path("run")));

@@ -14,8 +14,8 @@ using TType = TCIMValue::TCIMType;
 TEST(JsonTest, EachKindOfValueHasItsKindOfJson) {
   std::vector<TCIMValue> const elements = {"a", TCIMValue(TType::kCIMTypeString, 0)};
   struct TRow {
-    TCIMValue value;
-    char const* json;
+    TCIMValue fValue;
+    char const* fJson;
   } const rows[] = {
       {TCIMValue(), "null"},
       {TCIMValue(TType::kCIMTypeUint32, 0), "null"},
@@ -40,7 +40,7 @@ TEST(JsonTest, EachKindOfValueHasItsKindOfJson) {
       {TCIMValue(TType::kCIMTypeUint64, 0, std::vector<TCIMValue>{TCIMValue(7ul)}), "[\"7\"]"},
       {TCIMValue(TType::kCIMTypeString, 0, std::vector<TCIMValue>()), "[]"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(ValueAsJson(row.value).dump(), row.json);
+  for (TRow const& row : rows) EXPECT_EQ(ValueAsJson(row.fValue).dump(), row.fJson);
 }
 
 TEST(JsonTest, TypesHaveTheirNames) {

@@ -14,8 +14,8 @@ using TProcessors = std::vector<TProcessorKind>;
 
 TEST(ReportPhrasesTest, ValuesArePutIntoWords) {
   struct TRow {
-    TReportValue value;
-    char const* text;
+    TReportValue fValue;
+    char const* fText;
   } const rows[] = {
       {"Server Q100", "Server Q100"},
       {TDate{2024, 3, 9}, "2024-03-09"},
@@ -27,7 +27,7 @@ TEST(ReportPhrasesTest, ValuesArePutIntoWords) {
       {TMemorySize{512 << 20, 1, 0}, "512 MiB in 1 module"},
       {TMemorySize{512 << 20, 2, 1}, "512 MiB in 2 modules, 1 of them of unknown size"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(ValueText(row.value), row.text);
+  for (TRow const& row : rows) EXPECT_EQ(ValueText(row.fValue), row.fText);
 }
 
 TReportRow Row(std::string const& key, std::string const& label, TReportAnswer const& answer) { return {key, label, answer}; }

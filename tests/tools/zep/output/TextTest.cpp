@@ -92,8 +92,8 @@ TEST(TextTest, CellsAreMadePrintable) {
 
 TEST(TextTest, SizesAreRoundedOrExact) {
   struct TRow {
-    std::uint64_t bytes;
-    char const *rounded, *exact;
+    std::uint64_t fBytes;
+    char const *fRounded, *fExact;
   } const rows[] = {
       {0, "0 B", "0 bytes"},
       {1023, "1023 B", "1023 bytes"},
@@ -110,8 +110,8 @@ TEST(TextTest, SizesAreRoundedOrExact) {
       {1152921504606846976, "1048576 TiB", "1048576 TiB"},
   };
   for (TRow const& row : rows) {
-    EXPECT_EQ(SizeText(row.bytes), row.rounded) << row.bytes;
-    EXPECT_EQ(ExactSizeText(row.bytes), row.exact) << row.bytes;
+    EXPECT_EQ(SizeText(row.fBytes), row.fRounded) << row.fBytes;
+    EXPECT_EQ(ExactSizeText(row.fBytes), row.fExact) << row.fBytes;
   }
 }
 
