@@ -158,6 +158,69 @@ TEST(HouseTest, EveryTestOfARoomHasASourceOfItsName) {
     EXPECT_TRUE(fs::exists(kSource / "tests" / known.fPath)) << known.fPath << ", " << known.fReason;
 }
 
+// ---- Names of fields in the tests ----
+
+// clang-tidy checks the names of fields outside of the tests. For the tests it would take too long: here the lines are compared
+// with the forms that clang-format gives to declarations.
+
+std::string WithoutTemplateArguments(std::string text) {
+  static std::regex const innermost("<[^<>]*>");
+  for (std::string before; before != text; text = std::regex_replace(before, innermost, "")) before = text;
+  return text;
+}
+
+// The fields that a line of a class declares: "  char const *name, *text = nullptr;  // null: none" declares "name" and "text".
+std::vector<std::string> FieldsDeclaredBy(std::string const& line) {
+  static std::regex const other(R"(^\s*(//|#|(using|typedef|static|friend|enum|struct|class|union|template|return)\b))");
+  static std::regex const valueOrComment(R"( = .*|\{.*|\[.*|;.*)");
+  static std::regex const pointerToFunction(R"(^[^(]*\(\*(?:const )?(\w+)\)\(.*)");
+  static std::regex const declaration(R"(^\s*(?:[\w:]+ )*[\w:]+[ *&]+(\w+(?:, [*&]*\w+)*)$)");
+  static std::regex const name(R"(\w+)");
+  std::smatch match;
+  if (std::regex_search(line, other)) return {};
+  std::string const plain = std::regex_replace(WithoutTemplateArguments(line), valueOrComment, "");
+  if (std::regex_match(plain, match, pointerToFunction)) return {match[1]};
+  if (!std::regex_match(plain, match, declaration)) return {};
+  std::string const names = match[1];
+  return {std::sregex_token_iterator(names.begin(), names.end(), name), std::sregex_token_iterator()};
+}
+
+// The fields of all classes of a source.
+std::vector<std::string> FieldsOf(fs::path const& source) {
+  static std::regex const beginning(R"(^(\s*)(?:struct|class|union)\b[^;]*\{$)");
+  std::vector<std::string> fields, indents;  // of the classes that the line is part of, the innermost last
+  std::ifstream file(source);
+  std::smatch match;
+  for (std::string line; std::getline(file, line);) {
+    std::size_t const indent = std::min(line.find_first_not_of(' '), line.size());
+    if (!indents.empty() && indent == indents.back().size() && line[indent] == '}') indents.pop_back();
+    if (!indents.empty() && indent == indents.back().size() + 2)
+      for (std::string& field : FieldsDeclaredBy(line)) fields.push_back(std::move(field));
+    if (std::regex_match(line, match, beginning)) indents.push_back(match[1]);
+  }
+  return fields;
+}
+
+// Here the fields have plain names: the tests of the transfers, and what they share with others.
+bool HasPlainFields(fs::path const& source) {
+  std::string const path = fs::relative(source, kSource / "tests").string();
+  for (char const* beginning :
+       {"system/transfer/", "tools/zep/transfer/", "tools/zep/secrets/", "tools/zep/Zep.h", "os/Programs.h"})
+    if (path.rfind(beginning, 0) == 0) return true;
+  return false;
+}
+
+TEST(HouseTest, FieldsOfTestsBeginWithF) {
+  static std::regex const isOfTheHouse("(f[A-Z0-9]|k[A-Z]).*");
+  int checked = 0;
+  for (fs::path const& source : SourcesOf("tests"))
+    for (std::string const& field : FieldsOf(source)) {
+      EXPECT_TRUE(HasPlainFields(source) || std::regex_match(field, isOfTheHouse)) << source << ": " << field;
+      ++checked;
+    }
+  EXPECT_GT(checked, 500);
+}
+
 TEST(HouseTest, ZepcoreHeaderIncludesEveryPublicHeader) {
   std::set<std::string> const all = [] {
     auto const names = QuotedIncludesOf(kSource / "include/zepcore.h");
