@@ -226,7 +226,7 @@ TEST(NoServerTest, WithoutLibcurlAnywhereEachCallSaysSo) {
   EXPECT_EQ(outcome, line + line);
 }
 
-TEST(NoServerTest, AServerThatIsNoneOfItsKindIsDenied) {
+TEST(NoServerTest, AServerOfAnotherProtocolIsDenied) {
   std::string const why = WhyNoServer("ftp.sh");
   NEEDS(why.empty(), why);
   TFileServer const server("ftp");

@@ -8,9 +8,12 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <linux/filter.h>
+#include <linux/seccomp.h>
 #include <poll.h>
 #include <pty.h>
 #include <sys/inotify.h>
+#include <sys/syscall.h>
 #include <nlohmann/json.hpp>
 
 #include <algorithm>
@@ -138,7 +141,7 @@ TEST_F(ZepTransferTest, AnEmptyFileArrives) {
   EXPECT_EQ(fs::file_size(fDir.Path("back")), 0u);
 }
 
-TEST_F(ZepTransferTest, AFileThatIsThereIsLeftWhereNobodyCanAnswer) {
+TEST_F(ZepTransferTest, AnExistingFileIsKeptWithoutATerminal) {
   WriteFile(Remote("f"), "new");
   std::string const file = Local("f", "old");
   TProgramRun run = Zep("get " + Url("f") + " " + file);
@@ -177,7 +180,7 @@ TEST_F(ZepTransferTest, OnlyARegularFileIsOverwritten) {
   EXPECT_TRUE(fs::is_fifo(fifo));
 }
 
-TEST_F(ZepTransferTest, ASymbolicLinkStaysAndWhatItLeadsToIsWritten) {
+TEST_F(ZepTransferTest, ASymbolicLinkStaysAndItsTargetIsWritten) {
   WriteFile(Remote("f"), "new");
   fs::create_directory(fDir.Path("d"));
   std::string const file = Local("d/f", "old");
@@ -356,7 +359,7 @@ TEST_F(ZepTransferTest, AForeignFileWithTheNameOfANoteStays) {
   EXPECT_TRUE(ReadFile(file) == std::string(2000000, 'x'));
 }
 
-TEST_F(ZepTransferTest, AnUploadBearsAnotherNameUntilAllHasArrived) {
+TEST_F(ZepTransferTest, AnUploadHasATemporaryNameUntilItIsComplete) {
   WriteFile(Remote("f"), "old");
   EXPECT_EQ(Zep("send " + Local("f", "new") + " " + Url("f")).exitCode, kComplete);
   EXPECT_EQ(ReadFile(Remote("f")), "new");
@@ -385,7 +388,7 @@ TEST(ZepRenameTest, WhereTheServerDoesNotRenameTheFileIsSentToItsPlace) {
   }
 }
 
-TEST_F(ZepTransferTest, ADownloadHasAGreatestSize) {
+TEST_F(ZepTransferTest, ADownloadHasASizeLimit) {
   WriteFile(Remote("big"), std::string(3000000, 'x'));
   std::string const file = fDir.Path("f");
   TProgramRun run = Zep("get --max-size 1M " + Url("big") + " " + file);
@@ -410,7 +413,7 @@ TEST_F(ZepTransferTest, ADownloadHasAGreatestSize) {
               "zep: --max-size takes SIZE, such as 500K, 2M or 1G\n");
 }
 
-TEST_F(ZepTransferTest, ADownloadOfUnknownSizeEndsAtTheGreatestSize) {
+TEST_F(ZepTransferTest, ADownloadOfUnknownSizeEndsAtTheSizeLimit) {
   WriteFile(Remote("big"), std::string(3000000, 'x'));
   TServer const relay("relay.py", {"--ftp", "--hide-size", "0", fServer->Port(), "1000000000"});
   std::string const file = fDir.Path("f"), url = fServer->UrlAt(relay.Port(), "big");
@@ -428,6 +431,7 @@ TEST_F(ZepTransferTest, ADownloadOfUnknownSizeEndsAtTheGreatestSize) {
 struct TInterrupted {
   std::string output;
   int signal;
+  int exitCode;  // -1: ended by a signal
 };
 
 // With `isReadyAgain` the signal is sent again and again from then on, until zep has ended. `prefix` begins the command.
@@ -452,10 +456,10 @@ TInterrupted InterruptedZep(std::string const& arguments, TTempDir const& dir, s
   EXPECT_TRUE(isEnded);
   if (!isEnded) ::kill(child, SIGKILL);
   if (!isEnded) ::waitpid(child, &status, 0);
-  return {ReadFile(printed), WIFSIGNALED(status) ? WTERMSIG(status) : 0};
+  return {ReadFile(printed), WIFSIGNALED(status) ? WTERMSIG(status) : 0, WIFEXITED(status) ? WEXITSTATUS(status) : -1};
 }
 
-TEST_F(ZepTransferTest, AnInterruptLeavesNothingUntold) {
+TEST_F(ZepTransferTest, AnInterruptReportsTheFilesThatAreLeft) {
   WriteFile(Remote("big"), std::string(30000000, 'x'));
   TServer const relay("relay.py", {"--ftp", "--how", "stall", "0", fServer->Port(), "100000"});
   TServer const silent("stall.py", {"0"});
@@ -493,10 +497,115 @@ TEST_F(ZepTransferTest, AnInterruptLeavesNothingUntold) {
   }
 }
 
+std::size_t CountOf(std::string const& word, std::string const& text) {
+  std::size_t count = 0;
+  for (std::size_t at = text.find(word); at != text.npos; at = text.find(word, at + 1)) ++count;
+  return count;
+}
+
+// The server has logged QUIT: zep now computes the checksum. If the interrupt comes too late, zep has done its work.
+TEST_F(ZepTransferTest, AnInterruptDuringTheChecksumEndsBothDocumentAndProcess) {
+  fs::create_directory(fDir.Path("tmp"));
+  std::string const file = Local("f", ""), back = fDir.Path("back");
+  fs::resize_file(file, 100000000);
+  for (std::string const& command : {"send --json " + file + " " + Url("f"), "get --json " + Url("f") + " " + back}) {
+    SCOPED_TRACE(command);
+    std::size_t const before = CountOf("QUIT", fServer->Log());
+    TInterrupted const run = InterruptedZep(
+        command, fDir, [&] { return CountOf("QUIT", fServer->Log()) > before; }, SIGTERM);
+    std::size_t const start = run.output.find('{'), end = run.output.rfind('}');
+    ASSERT_NE(end, std::string::npos) << run.output;
+    auto const document = nlohmann::json::parse(run.output.substr(start, end + 1 - start));
+    EXPECT_EQ(document["exitStatus"], run.signal == 0 ? run.exitCode : 128 + run.signal) << run.output;
+    EXPECT_TRUE(run.signal == SIGTERM || run.exitCode == kComplete) << run.output;
+    EXPECT_EQ(document["sha256"].is_null(), run.signal == SIGTERM);
+  }
+  EXPECT_NE(fs::exists(back), fs::exists(back + ".part"));
+  EXPECT_EQ(Zep("get --force " + Url("f") + " " + back).exitCode, kComplete);
+}
+
+TEST_F(ZepTransferTest, AnInterruptEndsTheWaitForANetrcThatIsAPipe) {
+  fs::create_directory(fDir.Path("tmp"));
+  std::string const pipe = fDir.Path("netrc");
+  ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+  TUniqueFd writer;
+  auto const isRead = [&] {
+    return static_cast<bool>(writer = TUniqueFd(::open(pipe.c_str(), O_WRONLY | O_NONBLOCK | O_CLOEXEC)));
+  };
+  std::string const command = "send --json --netrc " + pipe + " " + Local("f", "text") + " ftp://zep@127.0.0.1/f";
+  // The first signal may arrive before zep waits.
+  TInterrupted const run = InterruptedZep(command, fDir, isRead, SIGINT, [] { return true; });
+  EXPECT_EQ(run.signal, SIGINT);
+  EXPECT_THAT(run.output, AllOf(HasSubstr("\"exitStatus\": 130"), EndsWith(": interrupted\n")));
+}
+
+TEST_F(ZepTransferTest, WithoutAHomeDirectoryNoWarningIsPrinted) {
+  TProgramRun const run = RunProgram("env -u NETRC HOME=/dev/null " + kZep + "send --quiet " + Local("f", "text") + " " +
+                                     "ftp://readonly@127.0.0.1:" + fServer->Port() + "/f < /dev/null 2>&1");
+  EXPECT_EQ(run.exitCode, kNothing);
+  EXPECT_THAT(run.output, Not(HasSubstr("warning"))) << run.output;
+}
+
+TEST_F(ZepTransferTest, APartThatIsNotARegularFileIsRefused) {
+  WriteFile(Remote("f"), "text");
+  std::string const part = fDir.Path("f.part"), target = Local("target", "precious");
+  std::function<void()> const makers[] = {[&] { fs::create_symlink("target", part); },
+                                          [&] { EXPECT_EQ(::mkfifo(part.c_str(), 0600), 0); },
+                                          [&] { fs::create_directory(part); }};
+  for (std::function<void()> const& make : makers) {
+    make();
+    fs::file_type const type = fs::symlink_status(part).type();
+    TProgramRun const run = Zep("get " + Url("f") + " " + fDir.Path("f"));
+    EXPECT_EQ(run.exitCode, kNotWritten);
+    EXPECT_THAT(run.output, EndsWith(", " + part + ": " + part + " is not a regular file\n"));
+    EXPECT_EQ(fs::symlink_status(part).type(), type);
+    fs::remove(part);
+  }
+  EXPECT_EQ(ReadFile(target), "precious");
+  EXPECT_EQ(NamesIn(fDir.Path()), std::vector<std::string>{"target"});
+}
+
+// The flags with which a process has the file open; -1 when none has.
+int OpenFlagsOf(std::string const& file) {
+  for (fs::directory_entry const& process : fs::directory_iterator("/proc")) {
+    std::error_code gone;
+    for (fs::directory_entry const& opened : fs::directory_iterator(process.path() / "fd", gone)) {
+      if (fs::read_symlink(opened.path(), gone) != file) continue;
+      std::string const info = ReadFile((process.path() / "fdinfo" / opened.path().filename()).string());
+      return std::stoi(info.substr(info.find("flags:") + 6), nullptr, 8);
+    }
+  }
+  return -1;
+}
+
+// Lets every flock of this process and its children fail.
+bool FailLocks(int error) {
+  sock_filter const code[] = {
+      BPF_STMT(BPF_LD | BPF_W | BPF_ABS, offsetof(seccomp_data, nr)), BPF_JUMP(BPF_JMP | BPF_JEQ | BPF_K, SYS_flock, 0, 1),
+      BPF_STMT(BPF_RET | BPF_K, SECCOMP_RET_ERRNO | static_cast<unsigned>(error)), BPF_STMT(BPF_RET | BPF_K, SECCOMP_RET_ALLOW)};
+  sock_fprog const program = {std::size(code), const_cast<sock_filter*>(code)};
+  return ::prctl(PR_SET_NO_NEW_PRIVS, 1, 0, 0, 0) == 0 && ::prctl(PR_SET_SECCOMP, SECCOMP_MODE_FILTER, &program) == 0;
+}
+
+TEST_F(ZepTransferTest, AFileSystemWithoutLocksIsNamed) {
+  WriteFile(Remote("f"), "text");
+  for (int const error : {EBADF, ENOLCK, EOPNOTSUPP}) {
+    std::string const output = InChild([&]() -> std::string {
+      if (!FailLocks(error)) return "no filter";
+      TProgramRun const run = Zep("get " + Url("f") + " " + fDir.Path("f"));
+      return std::to_string(run.exitCode) + run.output;
+    });
+    EXPECT_THAT(output, testing::StartsWith("73zep: "));
+    EXPECT_THAT(output,
+                EndsWith(": " + fDir.Path("f.part.lock") + " cannot be locked: " + std::generic_category().message(error) +
+                         "; its file system does not support locks: fetch to another directory\n"));
+  }
+}
+
 constexpr char const* kSlowly = "TransferRate STOR 500\n";  // KiB a second
 constexpr char const* kPartUrl = "ftp://zep@127\\.0\\.0\\.1:[0-9]+/f\\.[0-9a-f]{8}\\.part";
 
-TEST_F(ZepTransferTest, WhatAnInterruptedUploadLeftIsRemovedOrNamed) {
+TEST_F(ZepTransferTest, ThePartOfAnInterruptedUploadIsRemovedOrNamed) {
   std::string const file = Local("f", std::string(30000000, 'x'));
   for (bool const isRemoved : {true, false})
     for (int const signal : {SIGINT, SIGTERM}) {
@@ -516,12 +625,6 @@ TEST_F(ZepTransferTest, WhatAnInterruptedUploadLeftIsRemovedOrNamed) {
             AllOf(testing::ContainsRegex(": interrupted; the server may have a part of it: " + std::string(kPartUrl) + "\n"),
                   HasSubstr("/" + NamesIn(tree).front() + "\n")));
     }
-}
-
-std::size_t CountOf(std::string const& word, std::string const& text) {
-  std::size_t count = 0;
-  for (std::size_t at = text.find(word); at != text.npos; at = text.find(word, at + 1)) ++count;
-  return count;
 }
 
 // The relay withholds the command that removes the part, so that the server never answers it.
@@ -570,7 +673,7 @@ TEST_F(ZepTransferTest, UnderNohupATransferSurvivesAHangUp) {
   EXPECT_THAT(fetched.output, HasSubstr(file + ": 500000 bytes, SHA-256 "));
 }
 
-TEST(ZepRenameTest, WhatTheServerDoesNotRemoveIsNamed) {
+TEST(ZepRenameTest, AFileThatTheServerDoesNotRemoveIsNamed) {
   TTempDir const dir;
   WriteFile(dir.Path("f"), "text");
   struct {
@@ -831,7 +934,7 @@ TEST_F(ZepTransferTest, ANetrcThatEveryUserMayReadIsWarnedOf) {
 }
 
 // Root can read every file, so that a directory stands for one that cannot be read.
-TEST_F(ZepTransferTest, ANetrcThatCannotBeReadIsNotPassedOverInSilence) {
+TEST_F(ZepTransferTest, AnUnreadableNetrcIsReported) {
   std::string const file = Local("f", "text"), url = " ftp://zep@127.0.0.1:" + fServer->Port() + "/f";
   std::string const line = "machine 127.0.0.1 login zep password secret\n";
   std::string const tooLong = Private("long", line + std::string(1 << 20, '#')), directory = fDir.Path("directory");
@@ -903,7 +1006,8 @@ TEST_F(ZepTransferTest, OneDownloadAtATimeHasTheFile) {
   EXPECT_TRUE(IsTrueSoon([&] { return HasContent(part); }));
   TProgramRun const second = Zep("get " + Url("f") + " " + file);
   EXPECT_EQ(second.exitCode, kNotWritten);
-  EXPECT_THAT(second.output, EndsWith("/f, " + part + ": another transfer into the file goes on\n"));
+  EXPECT_THAT(second.output, EndsWith("/f, " + part + ": another transfer into the file is running\n"));
+  EXPECT_EQ(OpenFlagsOf(part + ".lock") & O_ACCMODE, O_RDWR) << "NFS locks only files that are open for writing";
   relay.Stop();
   running.join();
   EXPECT_EQ(first.exitCode, kNothing) << first.output;
@@ -911,7 +1015,7 @@ TEST_F(ZepTransferTest, OneDownloadAtATimeHasTheFile) {
   EXPECT_EQ(NamesIn(fDir.Path()), (std::vector<std::string>{"f.part", "f.part.from"}));
 }
 
-TEST_F(ZepTransferTest, WhatAKilledDownloadLeftIsNoHindrance) {
+TEST_F(ZepTransferTest, TheFilesOfAKilledDownloadAreReused) {
   WriteFile(Remote("f"), "text");
   Local("f.part", "old");
   Local("f.part.lock", "");
@@ -985,7 +1089,7 @@ void MakeWhenDeleted(int watch, std::string const& directory, std::string const&
 }
 
 // The library finds the file, asks, gets no answer, and returns as if all were well.
-TEST_F(ZepTransferTest, AFileThatComesInTheWayIsNotTakenForTheDownload) {
+TEST_F(ZepTransferTest, AnotherProgramsFileIsNotTakenForTheDownload) {
   WriteFile(Remote("f"), "text");
   std::string const file = fDir.Path("f");
   std::string reason;
@@ -1079,7 +1183,7 @@ TEST_F(ZepTransferTest, EachKindOfFailureHasItsStatus) {
             "package libcurl4\n");
 }
 
-TEST_F(ZepTransferTest, NothingIsSentOfWhatCannotBeRead) {
+TEST_F(ZepTransferTest, AnUnreadableFileIsNotSent) {
   struct TRow {
     std::string file, reason;
   };
@@ -1103,7 +1207,7 @@ TEST_F(ZepTransferTest, AFileThatFailsHalfWayLeavesNothingOnTheServer) {
 }
 #endif
 
-TEST_F(ZepTransferTest, AnAtSignInAPathIsNoPassword) {
+TEST_F(ZepTransferTest, AnAtSignInAPathIsNotAPassword) {
   std::string const file = Local("f", "text");
   EXPECT_EQ(Zep("send " + file + " " + Url("a@b")).exitCode, kComplete) << "behind a user";
   EXPECT_EQ(ReadFile(Remote("a@b")), "text");
@@ -1278,7 +1382,7 @@ TEST_F(ZepTransferTest, OnATerminalItAsksForThePasswordAndShowsNoneOfIt) {
   EXPECT_EQ(ReadFile(Remote("f")), "text");
 }
 
-TEST_F(ZepTransferTest, AnInterruptAtThePromptLeavesTheTerminalAsItWas) {
+TEST_F(ZepTransferTest, AnInterruptAtThePromptRestoresTheTerminal) {
   TTerminalRun const run = ZepOnTerminal({"send", "--netrc", "/dev/null", Local("f", "text"), "ftp://zep@127.0.0.1/f"},
                                          {{"Password of zep at 127.0.0.1: ", "sec\x03"}});
   EXPECT_EQ(run.signal, SIGINT);
@@ -1349,7 +1453,7 @@ TEST(ZepReportTest, IsKeptWhenItCannotBeSent) {
 
 // ---- The proxy ----
 
-TEST(ZepProxyCheckTest, PassesOnlyWhenThePageComesBack) {
+TEST(ZepProxyCheckTest, PassesOnlyWhenThePageIsReturned) {
   std::string const why = WhyNoServer("proxy.sh");
   NEEDS(why.empty(), why);
   TTempDir const dir;

@@ -29,6 +29,7 @@ constexpr char const* kVariable = "ZEP_BMC_PASSWORD";
 
 TSecret PasswordIn(std::string const& path) {
   TPrivateFile const file(path);
+  ThrowIfInterrupted();
   std::string const name = NameOfPrivateFile(path, "--password-file");
   if (file.Error() != 0) throw std::runtime_error(name + " cannot be read: " + file.Reason());
   if (file.Text().empty()) throw std::runtime_error("there is no password in " + name);

@@ -3,6 +3,7 @@
 
 #include "core/Handles.h"
 #include "tools/zep/output/Text.h"
+#include "tools/zep/processes/Interrupts.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -35,7 +36,7 @@ TPrivateFile::TPrivateFile(std::string const& path) : fPath(path) {
   ssize_t got = file ? 1 : -1;
   while (got > 0 && fText.size() <= kMostBytes) {
     got = ::read(file.get(), chunk.data(), chunk.size());
-    if (got < 0 && errno == EINTR)
+    if (got < 0 && errno == EINTR && PendingInterrupt() == 0)
       got = 1;
     else if (got > 0)
       fText.insert(fText.end(), chunk.begin(), chunk.begin() + got);

@@ -13,7 +13,8 @@ namespace NQRVZEP20::zep {
 // A file with passwords, read completely into memory that is overwritten at the end.
 class TPrivateFile {
 public:
-  // A file that cannot be read to its end, or is longer than 1 MiB, leaves the text empty, with the reason in Error().
+  // Blocks while a pipe has no data. A file that cannot be read to its end, or is longer than 1 MiB, leaves the text empty, with
+  // the reason in Error(); after an interrupt (Interrupts.h) that is EINTR.
   explicit TPrivateFile(std::string const& path);
 
   std::string_view Text() const { return {fText.data(), fText.size()}; }

@@ -3,6 +3,7 @@
 
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Text.h"
+#include "tools/zep/processes/Interrupts.h"
 #include "tools/zep/secrets/Password.h"
 #include "tools/zep/secrets/PrivateFile.h"
 #include "tools/zep/transfer/UrlCoding.h"
@@ -132,7 +133,7 @@ TLogin LoginIn(std::string_view netrc, TRemote const& remote) {
 void CheckNetrc(TPrivateFile const& file, std::string const& path, bool isOption) {
   if (file.Error() == 0) return;
   if (isOption) throw TWrongUsage(NameOfPrivateFile(path, "--netrc") + ": " + file.Reason());
-  if (file.Error() == ENOENT) return;
+  if (file.Error() == ENOENT || file.Error() == ENOTDIR) return;  // as with HOME=/dev/null
   std::cerr << "zep: warning: " << Printable(path) << " cannot be read, and no login is taken from it: " << file.Reason() << "\n";
 }
 
@@ -140,6 +141,7 @@ void CheckNetrc(TPrivateFile const& file, std::string const& path, bool isOption
 TLogin LoginOf(TRemote const& remote, std::string const& netrcFile) {
   std::string const path = netrcFile.empty() ? DefaultNetrc() : netrcFile;
   TPrivateFile const file(path);
+  ThrowIfInterrupted();
   CheckNetrc(file, path, !netrcFile.empty());
   TLogin login = LoginIn(file.Text(), remote);
   if (!login.fPassword.IsEmpty()) file.WarnWhenOthersMayRead();

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/transfer/Sha256.h"
 
+#include "tools/zep/processes/Interrupts.h"
+
 #include <gcrypt.h>
 
 #include <cerrno>
@@ -53,8 +55,11 @@ std::string Sha256Of(std::string const& file) {
   if (!stream) throw std::system_error(errno, std::generic_category(), file);
   THash const hash = NewHash();
   std::vector<unsigned char> chunk(65536);
-  while (std::size_t const got = std::fread(chunk.data(), 1, chunk.size(), stream.get()))
+  while (std::size_t const got = std::fread(chunk.data(), 1, chunk.size(), stream.get())) {
+    if (PendingInterrupt() != 0) return "";
     gcry_md_write(hash.get(), chunk.data(), got);
+  }
+  if (PendingInterrupt() != 0) return "";
   if (std::ferror(stream.get()) != 0) throw std::system_error(EIO, std::generic_category(), file);
   return DigitsOf(gcry_md_read(hash.get(), GCRY_MD_SHA256), gcry_md_get_algo_dlen(GCRY_MD_SHA256));
 }

@@ -2,6 +2,7 @@
 #include "tools/zep/transfer/Transfer.h"
 
 #include "core/Handles.h"
+#include "core/TNeverDestroyed.h"
 #include "os/RemotePath.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Output.h"
@@ -37,6 +38,7 @@
 #include <filesystem>
 #include <iostream>
 #include <limits>
+#include <optional>
 #include <string_view>
 #include <vector>
 
@@ -115,6 +117,37 @@ TTransferred TransferOf(TRemote const& remote, std::string const& file) {
 TTransferred Failed(TTransferred transferred, EExitStatus exit, std::string const& reason) {
   transferred.fOutcome = {kZEPStatusFail, exit, reason};
   return transferred;
+}
+
+// Called when only the outcome is left to be printed. Returns true when an interrupt is pending, which then ends zep. Otherwise
+// no interrupt has an effect from now on, and zep ends with the status that it prints.
+bool IsInterruptedAtLast() {
+  static TNeverDestroyed<std::optional<TInterruptsBlocked>> blocked;
+  blocked->emplace();
+  bool const isPending = PendingInterrupt() != 0;
+  if (isPending) blocked->reset();
+  return isPending;
+}
+
+// The transfer with its final outcome: the interrupt, if there is one.
+TTransferred Decided(TTransferred transferred) {
+  TOutcome const outcome = transferred.fOutcome;
+  if (!IsInterruptedAtLast() || outcome.fExit >= kExitHangUp) return transferred;
+  bool const isComplete = outcome.fExit == kExitComplete;
+  std::string const reason = isComplete ? "interrupted after the file had arrived" : outcome.fReason + "; interrupted";
+  return Failed(transferred, StatusOfInterrupt(), reason);
+}
+
+// Fills in user and password. False, with the outcome, after an interrupt.
+bool FindPasswordOf(TRemote& remote, TTransferred& transferred, TTransferOptions const& options) {
+  try {
+    FindPassword(remote, options.fNetrc);
+    return true;
+  } catch (std::exception const&) {
+    if (PendingInterrupt() == 0) throw;
+    transferred.fOutcome = Interrupted();
+    return false;
+  }
 }
 
 // Reads "500K" into the bytes; returns why that cannot be, or an empty text.
@@ -231,16 +264,23 @@ public:
 
 private:
   bool Open() {
-    fFile = TUniqueFd(::open(fPath.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC, 0666));
+    fFile = TUniqueFd(::open(fPath.c_str(), O_RDWR | O_CREAT | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC, 0666));
+    int const openError = errno;
     struct stat opened {};
     bool const isRegular = fFile && ::fstat(fFile.get(), &opened) == 0 && S_ISREG(opened.st_mode);
     if (isRegular && ::flock(fFile.get(), LOCK_EX | LOCK_NB) == 0) return true;
     if (fFile && !isRegular)
       fWhyNotHad = Printable(fPath) + " is not a regular file";
     else
-      fWhyNotHad = errno == EWOULDBLOCK ? "another transfer into the file goes on" : ReasonOf(errno);
+      fWhyNotHad = fFile ? WhyNotLocked(errno) : Printable(fPath) + " cannot be opened: " + ReasonOf(openError);
     Close();
     return false;
+  }
+  std::string WhyNotLocked(int error) const {
+    if (error == EWOULDBLOCK) return "another transfer into the file is running";
+    bool const isUnsupported = error == EBADF || error == ENOLCK || error == EOPNOTSUPP;
+    return Printable(fPath) + " cannot be locked: " + ReasonOf(error) +
+           (isUnsupported ? "; its file system does not support locks: fetch to another directory" : "");
   }
   void Close() { fFile = TUniqueFd(); }
   bool IsStillThere() const {
@@ -316,13 +356,15 @@ bool IsRegularFile(std::string const& file) {
   return ::lstat(file.c_str(), &status) == 0 && S_ISREG(status.st_mode);
 }
 
-// Whether a part could be written; one that an earlier transfer left stays. False, with errno set, when not.
-bool CanMakePart(std::string const& part, bool isThere) {
-  if (isThere) return static_cast<bool>(TUniqueFd(::open(part.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC)));
-  if (::unlink(part.c_str()) != 0 && errno != ENOENT) return false;
-  if (!MakeEmptyFile(part)) return false;
+// Why no part can be written; empty when one can. A part that an earlier transfer left stays.
+std::string WhyNoPart(std::string const& part) {
+  struct stat status {};
+  bool const isThere = ::lstat(part.c_str(), &status) == 0;
+  if (isThere && !S_ISREG(status.st_mode)) return Printable(part) + " is not a regular file";
+  if (isThere) return TUniqueFd(::open(part.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC)) ? "" : ReasonOf(errno);
+  if (!MakeEmptyFile(part)) return ReasonOf(errno);
   ::unlink(part.c_str());
-  return true;
+  return "";
 }
 
 TTransferred BrokenOff(TTransferred transferred, bool wasThere, TTransferState const& state, TTransferOptions const& options) {
@@ -342,13 +384,17 @@ TTransferred BrokenOff(TTransferred transferred, bool wasThere, TTransferState c
   return transferred;
 }
 
-// Gives the part, all of which has arrived, the name of the file.
-TTransferred Completed(TTransferred transferred, std::string const& file, bool overwrites) {
+// Gives the part, which is complete, the name of the file. An interrupt before that leaves the part.
+TTransferred Completed(TTransferred transferred, std::string const& file, bool overwrites, TTransferState const& state) {
   std::string const& part = transferred.fFile;
   // An empty file does not arrive at all.
   if (!fs::exists(part) && !MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
   transferred.fBytes = fs::file_size(part);
   transferred.fSha256 = Sha256Of(part);
+  if (IsInterruptedAtLast()) {
+    MarkForResuming(part, state);
+    return Failed(transferred, StatusOfInterrupt(), "interrupted" + PartText(part));
+  }
   SetMode(part, ModeFor(file));
   if (!Rename(part, file, overwrites))
     return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + ReasonOf(errno));
@@ -360,7 +406,7 @@ TTransferred Completed(TTransferred transferred, std::string const& file, bool o
 }  // namespace
 
 void AddTransferOptions(CLI::App& command, TTransferOptions& options) {
-  command.add_flag("--quiet", options.fQuiet, "No progress, and no word when all went well");
+  command.add_flag("--quiet", options.fQuiet, "No progress, and no message after a success");
   command
       .add_option("--stall", options.fStallSeconds,
                   "The longest standstill allowed, in seconds (60); 0 waits for ever. What is sent counts as moved when\n"
@@ -389,7 +435,7 @@ void AddSizeOption(CLI::App& command, std::string const& name, std::uint64_t& by
 
 std::string TransferHelp() {
   return "Passwords come from the URL (which other users may see in the list of processes), from netrc, or from a prompt.\n"
-         "The key of an SFTP server is not checked: who stands in its place gets the password.\n"
+         "The key of an SFTP server is not checked: an impostor gets the password.\n"
          "In the path of a URL blanks and the like may be written as they are; \"%20\" stays what it is.\n"
          "Exit status: 0 when all went well, 1 when the server refused it or the transfer broke off, 64 for wrong usage,\n"
          "66 when the file to be sent cannot be read, 68 when the host is unknown or nobody answers, 69 without libcurl,\n"
@@ -413,9 +459,10 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
   if (!why.empty()) return Failed(transferred, kExitNoInput, why);
   transferred.fBytes = static_cast<std::uint64_t>(before.st_size);
 
-  FindPassword(target.fRemote, options.fNetrc);
+  bool const isReady = FindPasswordOf(target.fRemote, transferred, options);
   TRemote const place = PlaceOf(target);
   transferred.fUrl = ShownUrlOf(place);
+  if (!isReady) return transferred;
   TSharedTransferState const state;
   int const cleanUpSeconds = CleanUpSecondsOf(options);
   TUploadNames const names = NamesForUpload(place);
@@ -427,29 +474,32 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
     CleanUp(place, names, CleanUpSecondsAfterEnd(options), *state);
   ExplainNoConnection(transferred.fOutcome, place);
   ExplainUpload(transferred, place, names, *state);
-  if (exit != kExitComplete) return transferred;
+  if (exit != kExitComplete) return Decided(transferred);
   bool const isAsBefore = IsAsBefore(file, before);
   if (isAsBefore) transferred.fSha256 = Sha256Of(file);
-  if (!isAsBefore || !IsAsBefore(file, before)) return Failed(transferred, kExitPartial, "the file changed while it was sent");
-  return transferred;
+  if (!isAsBefore || !IsAsBefore(file, before))
+    return Decided(Failed(transferred, kExitPartial, "the file changed while it was sent"));
+  return Decided(transferred);
 }
 
 TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, TTransferOptions const& options) {
   std::string const part = file + ".part";
   TTransferred transferred = TransferOf(remote, part);
-  FindPassword(remote, options.fNetrc);
+  bool const isReady = FindPasswordOf(remote, transferred, options);
   transferred.fUrl = ShownUrlOf(remote);
+  if (!isReady) return transferred;
   TLockFile const lock(part + ".lock");
   if (!lock.WhyNotHad().empty()) return Failed(transferred, kExitNotWritten, lock.WhyNotHad());
+  std::string const why = WhyNoPart(part);
+  if (!why.empty()) return Failed(transferred, kExitNotWritten, why);
   bool const isThere = IsRegularFile(part);
-  if (!CanMakePart(part, isThere)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
   if (!isThere) RemoveNote(part);
   TSharedTransferState const state;
   std::uint64_t const most = options.fMostBytes;
   transferred.fOutcome = Transfer([&] { return Download(remote, part, isThere, most, *state); }, *state, 0, options);
   ExplainNoConnection(transferred.fOutcome, remote);
-  if (transferred.fOutcome.fExit != kExitComplete) return BrokenOff(transferred, isThere, *state, options);
-  return Completed(transferred, file, overwrites);
+  if (transferred.fOutcome.fExit != kExitComplete) return Decided(BrokenOff(transferred, isThere, *state, options));
+  return Completed(transferred, file, overwrites, *state);
 }
 
 void WarnOfLeft(TTransferred const& transferred) {

@@ -20,7 +20,7 @@ constexpr std::uint64_t kUsualMostBytes = std::uint64_t{10} << 30;
 
 // What every command that transfers files can be told.
 struct TTransferOptions {
-  bool fQuiet = false;  // no progress, and no word when all went well
+  bool fQuiet = false;  // no progress, and no message after a success
   int fStallSeconds = kUsualStallSeconds;
   std::string fNetrc;
   std::uint64_t fMostBytes = kUsualMostBytes;  // of a file that is fetched; 0: any size

@@ -50,7 +50,7 @@ private:
   std::string fNumber;
 };
 
-TEST(UnreachableTest, ARefusedPortIsToldFromAHostThatIsUnknown) {
+TEST(UnreachableTest, ARefusedPortAndAnUnknownHostHaveDifferentReasons) {
   TPort const port;
   EXPECT_EQ(WhyUnreachable("127.0.0.1", port.Number(), 3),
             "127.0.0.1 refuses connections to port " + port.Number() + "; is the server running, and the port right?");

@@ -23,7 +23,7 @@ std::function<TZEPStatusCode()> Thrown(EZEPStatusCode status, char const* reason
   return [=]() -> TZEPStatusCode { throw TZEPFailure(status, reason); };
 }
 
-TEST(RunWatchedTest, OutcomeIsWhatTheTransferThrows) {
+TEST(RunWatchedTest, OutcomeIsTheFailureThatTheTransferThrows) {
   struct TRow {
     std::function<TZEPStatusCode()> transfer;
     EExitStatus exit;
@@ -112,7 +112,7 @@ TEST(RunWatchedTest, MovementIsSeen) {
   }
 }
 
-TEST(RunWatchedTest, AFileHasAGreatestSize) {
+TEST(RunWatchedTest, AFileHasASizeLimit) {
   TTempDir const dir;
   TWatch watch;
   watch.fFile = dir.Path("f");
