@@ -1,0 +1,50 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+#include <string_view>
+#include <type_traits>
+
+namespace NQRVZEP20 {
+
+// Reads what TByteWriter wrote, or any other bytes: every length is checked against the bytes that are left. All members throw
+// TBadAnswer when the bytes end too early. The bytes must outlive the reader and the texts that it returns.
+class TByteReader {
+public:
+  explicit TByteReader(std::string_view bytes, std::size_t at = 0);  // begins at a position up to the end
+
+  std::size_t At() const { return fAt; }
+  std::size_t Left() const { return fBytes.size() - fAt; }
+
+  unsigned char Byte();
+  std::uint64_t Number();
+
+  // A number that is at most `most`; `what` names it in the exception for a greater one.
+  std::uint64_t NumberUpTo(std::uint64_t most, char const* what);
+
+  // A number of elements, each of which has at least one byte: at most `most`, and at most the number of bytes that are left.
+  std::size_t Count(std::uint64_t most, char const* what);
+
+  template <class T>
+  T Fixed() {
+    static_assert(std::is_arithmetic_v<T> && !std::is_same_v<T, bool>);
+    Require(sizeof(T));
+    T value;
+    std::memcpy(&value, fBytes.data() + fAt, sizeof value);
+    fAt += sizeof value;
+    return value;
+  }
+
+  std::string_view Text();
+  void Skip(std::size_t bytes);
+
+private:
+  void Require(std::size_t bytes) const;
+
+  std::string_view fBytes;
+  std::size_t fAt;
+};
+
+}  // namespace NQRVZEP20

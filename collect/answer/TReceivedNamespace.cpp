@@ -1,0 +1,147 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/answer/TReceivedNamespace.h"
+
+#include "KeyText.h"
+#include "TZEPException.h"
+#include "collect/answer/TNamespaceReader.h"
+
+#include <boost/make_shared.hpp>
+
+namespace NQRVZEP20 {
+
+void RefuseChange() { throw TZEPException(kZEPStatusNotSupported); }
+
+boost::shared_ptr<TReceivedNamespace> TReceivedNamespace::From(std::string bytes) {
+  boost::shared_ptr<TReceivedNamespace> const ns(new TReceivedNamespace(std::move(bytes)));
+  TNamespaceReader(ns).Read();
+  return ns;
+}
+
+std::string TReceivedNamespace::GetName(TCIMContext const&) const { return fName; }
+
+boost::shared_ptr<ICIMClass> TReceivedNamespace::CreateClass(boost::shared_ptr<ICIMClass>, std::string const&,
+                                                             TCIMContext const&) {
+  RefuseChange();
+}
+
+boost::shared_ptr<ICIMClass> TReceivedNamespace::GetClass(std::string const& className, TCIMContext const&) const {
+  auto const found = fNumbers.find(className);
+  if (found != fNumbers.end()) return fClasses[found->second];
+  if (fClassesFailure) fClassesFailure->Throw();  // the class may be one that the provider did not name any more
+  throw TZEPException(kZEPStatusNotFound);
+}
+
+void TReceivedNamespace::EnumerateClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)> callback,
+                                          TCIMContext const&) const {
+  for (auto const& [root, tree] : fTrees)
+    if (!callback(fClasses[root])) return;
+  if (fClassesFailure) fClassesFailure->Throw();
+}
+
+boost::shared_ptr<ICIMQualifierDecl> TReceivedNamespace::CreateQualifierDecl(std::string const&, TCIMValue const&, unsigned int,
+                                                                             unsigned int, TCIMContext const&) {
+  RefuseChange();
+}
+
+boost::shared_ptr<ICIMQualifierDecl> TReceivedNamespace::GetQualifierDecl(std::string const& name, TCIMContext const&) const {
+  for (auto const& declaration : fQualifierDecls)
+    if (IsSameName(declaration->Name(), name)) return declaration;
+  return {};
+}
+
+void TReceivedNamespace::EnumerateQualifierDecls(boost::function<bool(boost::shared_ptr<ICIMQualifierDecl>)> callback,
+                                                 TCIMContext const&) const {
+  for (auto const& declaration : fQualifierDecls)
+    if (!callback(declaration)) return;
+}
+
+boost::shared_ptr<ICIMInstance> TReceivedNamespace::GetInstance(TCIMReference const& path, TCIMContext const& context) const {
+  boost::shared_ptr<ICIMClass> const named = path.GetClass();
+  auto const cls = named ? fNumbers.find(named->GetName(context)) : fNumbers.end();
+  std::string const keys = KeyText(path);
+  if (cls == fNumbers.end() || keys.empty()) return {};
+  TByKeys const& byKeys = InstancesByKeys(cls->second);
+  auto const found = byKeys.find(keys);
+  return found == byKeys.end() ? boost::shared_ptr<ICIMInstance>() : found->second;
+}
+
+TCIMValue TReceivedNamespace::ValueAt(std::size_t at) const {
+  TByteReader reader = ReaderAt(at);
+  if (IsMissingValue(reader)) TRecordedFailure::ReadFrom(reader).Throw();
+  return ReadValue(reader, *this);
+}
+
+std::vector<boost::shared_ptr<TReceivedClass>> TReceivedNamespace::ClassesBelow(std::size_t number) const {
+  std::vector<bool> const isInTree = IsInTreeOf(number);
+  std::vector<boost::shared_ptr<TReceivedClass>> classes;
+  for (std::size_t cls = number + 1; cls < fClasses.size(); ++cls)
+    if (isInTree[cls]) classes.push_back(fClasses[cls]);
+  return classes;
+}
+
+// The instances of a tree are in the order in which the provider enumerates those of its root class.
+void TReceivedNamespace::VisitInstances(std::size_t cls,
+                                        boost::function<bool(boost::shared_ptr<ICIMInstance>)> const& callback) const {
+  std::size_t const root = RootOf(cls);
+  TTree const& tree = fTrees.at(root);
+  std::vector<bool> const isWanted = cls == root ? std::vector<bool>() : IsInTreeOf(cls);
+  for (std::size_t n = tree.fBegin; n < tree.fEnd; ++n) {
+    bool const isVisited = cls == root || isWanted[fInstances[n]->Layout().fClass];
+    if (isVisited && !callback(fInstances[n])) return;
+  }
+  if (tree.fFailure) tree.fFailure->Throw();
+}
+
+boost::shared_ptr<ICIMNamespace> TReceivedNamespace::Namespace() const {
+  return boost::const_pointer_cast<TReceivedNamespace>(shared_from_this());
+}
+
+boost::shared_ptr<ICIMClass> TReceivedNamespace::ClassAt(std::size_t number) const { return fClasses[number]; }
+
+boost::shared_ptr<ICIMClass> TReceivedNamespace::OutsideClass(std::string const& name) const {
+  auto& cls = fOutside[FoldName(name)];
+  TReceivedClass::TFacts facts;
+  facts.fIsOutside = true;
+  if (!cls)
+    cls = boost::make_shared<TReceivedClass>(boost::const_pointer_cast<TReceivedNamespace>(shared_from_this()), name, facts);
+  return cls;
+}
+
+void TReceivedNamespace::DeclareOutside(boost::shared_ptr<ICIMClass> const& cls, std::string const& key,
+                                        TCIMValue const& value) const {
+  auto const outside = boost::static_pointer_cast<TReceivedClass>(cls);
+  if (outside->FindPropertyDecl(key)) return;
+  TReceivedPropertyDecl::TFacts facts;
+  facts.fType = value.GetType();
+  facts.fDefaultAt = TReceivedPropertyDecl::kNoDefault;
+  facts.fIsKey = true;
+  facts.fOwner = outside;
+  outside->Add(
+      boost::make_shared<TReceivedPropertyDecl>(boost::const_pointer_cast<TReceivedNamespace>(shared_from_this()), key, facts));
+}
+
+// Made when it is first needed: most readers look no instance up.
+TReceivedNamespace::TByKeys const& TReceivedNamespace::InstancesByKeys(std::size_t cls) const {
+  auto const [place, isNew] = fByKeys.try_emplace(cls);
+  if (!isNew) return place->second;
+  TTree const& tree = fTrees.at(RootOf(cls));
+  for (std::size_t n = tree.fBegin; n < tree.fEnd; ++n)
+    if (fInstances[n]->Layout().fClass == cls)
+      place->second.emplace(KeyText(fInstances[n]->GetPath(TCIMContext())), fInstances[n]);
+  return place->second;
+}
+
+std::size_t TReceivedNamespace::RootOf(std::size_t cls) const {
+  while (fSupers[cls] != 0) cls = fSupers[cls] - 1;
+  return cls;
+}
+
+// A class comes after its superclass.
+std::vector<bool> TReceivedNamespace::IsInTreeOf(std::size_t cls) const {
+  std::vector<bool> isInTree(fClasses.size(), false);
+  isInTree[cls] = true;
+  for (std::size_t n = cls + 1; n < fClasses.size(); ++n) isInTree[n] = fSupers[n] != 0 && isInTree[fSupers[n] - 1];
+  return isInTree;
+}
+
+}  // namespace NQRVZEP20

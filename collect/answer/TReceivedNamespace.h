@@ -1,0 +1,92 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "CIMNames.h"
+#include "ICIMNamespace.h"
+#include "collect/answer/TByteReader.h"
+#include "collect/answer/TReceivedClass.h"
+#include "collect/answer/TReceivedInstance.h"
+#include "collect/answer/TReceivedLayout.h"
+#include "collect/answer/TReceivedQualifierDecl.h"
+#include "collect/answer/ValueBytes.h"
+
+#include <boost/enable_shared_from_this.hpp>
+
+#include <deque>
+#include <map>
+#include <string>
+#include <unordered_map>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+// A namespace that was received as bytes (NamespaceBytes.h). It answers as the provider did when it was written, and throws what
+// the provider threw. Every operation that would change it throws kZEPStatusNotSupported.
+//
+// The bytes are checked once, completely: later reads stay within them, whatever they contain. They are kept, and values are read
+// when they are needed, so a namespace takes little more memory than its bytes. An element that outlives its namespace throws
+// boost::bad_weak_ptr. Use it from one thread at a time.
+class TReceivedNamespace : public ICIMNamespace,
+                           public TReadingNamespace,
+                           public boost::enable_shared_from_this<TReceivedNamespace> {
+public:
+  // Throws TBadAnswer for bytes that are not a namespace, or exceed the limits (AnswerLimits.h).
+  static boost::shared_ptr<TReceivedNamespace> From(std::string bytes);
+
+  std::string GetName(TCIMContext const& context) const override;
+  boost::shared_ptr<ICIMClass> CreateClass(boost::shared_ptr<ICIMClass> superClass, std::string const& name,
+                                           TCIMContext const& context) override;
+  boost::shared_ptr<ICIMClass> GetClass(std::string const& className, TCIMContext const& context) const override;
+  void EnumerateClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)> callback, TCIMContext const& context) const override;
+  boost::shared_ptr<ICIMQualifierDecl> CreateQualifierDecl(std::string const& name, TCIMValue const& defaultValue,
+                                                           unsigned int scope, unsigned int flavor,
+                                                           TCIMContext const& context) override;
+  boost::shared_ptr<ICIMQualifierDecl> GetQualifierDecl(std::string const& name, TCIMContext const& context) const override;
+  void EnumerateQualifierDecls(boost::function<bool(boost::shared_ptr<ICIMQualifierDecl>)> callback,
+                               TCIMContext const& context) const override;
+  boost::shared_ptr<ICIMInstance> GetInstance(TCIMReference const& path, TCIMContext const& context) const override;
+
+  // ---- For its elements ----
+
+  TCIMValue ValueAt(std::size_t at) const;  // or throws the failure that is in its place
+  TByteReader ReaderAt(std::size_t at) const { return TByteReader(fBytes, at); }
+  std::vector<boost::shared_ptr<TReceivedClass>> ClassesBelow(std::size_t number) const;
+  void VisitInstances(std::size_t cls, boost::function<bool(boost::shared_ptr<ICIMInstance>)> const& callback) const;
+
+  boost::shared_ptr<ICIMNamespace> Namespace() const override;
+  boost::shared_ptr<ICIMClass> ClassAt(std::size_t number) const override;
+  boost::shared_ptr<ICIMClass> OutsideClass(std::string const& name) const override;
+  void DeclareOutside(boost::shared_ptr<ICIMClass> const& cls, std::string const& key, TCIMValue const& value) const override;
+
+private:
+  friend class TNamespaceReader;
+
+  // The instances of a root class and of the classes below it.
+  struct TTree {
+    std::size_t fBegin = 0, fEnd = 0;  // in fInstances
+    std::optional<TRecordedFailure> fFailure;
+  };
+
+  using TByKeys = std::unordered_map<std::string, boost::shared_ptr<TReceivedInstance>>;  // by KeyText of the path
+
+  explicit TReceivedNamespace(std::string bytes) : fBytes(std::move(bytes)) {}
+  TByKeys const& InstancesByKeys(std::size_t cls) const;  // of exactly that class
+  std::size_t RootOf(std::size_t cls) const;
+  std::vector<bool> IsInTreeOf(std::size_t cls) const;  // by class
+
+  std::string const fBytes;
+  std::string fName;
+  std::vector<boost::shared_ptr<TReceivedQualifierDecl>> fQualifierDecls;
+  std::vector<boost::shared_ptr<TReceivedClass>> fClasses;
+  std::vector<std::size_t> fSupers;  // the number of the superclass plus 1, or 0; by class
+  std::unordered_map<std::string, std::size_t, TNameHash, TNameEqual> fNumbers;
+  std::optional<TRecordedFailure> fClassesFailure;
+  std::deque<TReceivedLayout> fLayouts;  // whose addresses are fixed
+  std::vector<boost::shared_ptr<TReceivedInstance>> fInstances;
+  std::map<std::size_t, TTree> fTrees;  // by the number of the root class
+
+  mutable std::map<std::size_t, TByKeys> fByKeys;                             // by class; of those that were searched
+  mutable std::map<std::string, boost::shared_ptr<TReceivedClass>> fOutside;  // by lower-case name
+};
+
+}  // namespace NQRVZEP20
