@@ -4,11 +4,10 @@
 #include "INamespaceProvider.h"
 #include "TOSSpecific.h"
 #include "TRootObject.h"
-#include "TZEPFailure.h"
-#include "collect/FailureOf.h"
+#include "collect/process/EStage.h"
+#include "collect/process/TimedFailure.h"
 
 #include <algorithm>
-#include <chrono>
 #include <filesystem>
 #include <map>
 #include <stdexcept>
@@ -28,49 +27,37 @@ TProviders RegisteredProviders() {
   return providers;
 }
 
-// Why a piece of work failed: both texts are empty when it succeeded, and the reason also when the failure carries none.
-struct TTimedFailure {
-  std::string fMessage, fReason;
-};
-
-// Runs the work as FailureOf does, and measures how long it takes.
-template <class TWork>
-TTimedFailure TimedFailureOf(TWork work, double& milliseconds) {
-  auto const start = std::chrono::steady_clock::now();
-  TTimedFailure failure;
-  failure.fMessage = FailureOf([&] {
-    try {
-      work();
-    } catch (TZEPFailure const& thrown) {
-      failure.fReason = thrown.Reason();
-      throw;
-    }
-  });
-  milliseconds = std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() - start).count();
-  return failure;
-}
-
 TProviderRun Fill(std::string const& name, boost::shared_ptr<INamespaceProvider> provider, std::string const& sampleLabel) {
   TProviderRun run{name, {}, 0, ""};
-  auto const fill = [&] {
+  TTimedFailure const failure = TimedFailureOf([&] {
     auto const ns = provider->GetNamespace(TCIMContext());
     if (!ns) throw std::runtime_error("it has no namespace");
     run.fView = std::make_shared<TNamespaceView>(name, ns, sampleLabel);
-  };
-  TTimedFailure const failure = TimedFailureOf(fill, run.fMilliseconds);
-  run.fError = failure.fReason.empty() ? failure.fMessage : failure.fMessage + " (" + failure.fReason + ")";
+  });
+  run.fMilliseconds = failure.fMilliseconds;
+  run.fError = failure.MessageAndReason();
+  if (!run.fError.empty()) run.fStage = NameOf(EStage::kFill);
   return run;
 }
 
 TPlugIn Load(std::string const& name, std::string const& sampleLabel) {
-  TPlugIn plugIn{name, PlugInDirectory() + TOSSpecific::kFileSeparator + "lib" + name + kNSPExtension, 0, "", {}};
+  TPlugIn plugIn{name, PlugInFile(name), 0, "", {}};
   TProviders const before = RegisteredProviders();
-  TTimedFailure const failure = TimedFailureOf([&] { TOSSpecific::LoadNSPLibrary(name); }, plugIn.fMilliseconds);
-  plugIn.fError = failure.fReason.empty() ? failure.fMessage : failure.fReason;  // of the dynamic linker
+  TTimedFailure const failure = TimedFailureOf([&] { TOSSpecific::LoadNSPLibrary(name); });
+  plugIn.fMilliseconds = failure.fMilliseconds;
+  plugIn.fError = failure.ReasonOrMessage();
+  if (!plugIn.fError.empty()) plugIn.fStage = NameOf(EStage::kOpen);
 
   for (auto const& [providerName, provider] : RegisteredProviders())
     if (before.count(providerName) == 0) plugIn.fProviders.push_back(Fill(providerName, provider, sampleLabel));
   return plugIn;
+}
+
+// "kZEPStatusAccessDenied (fill, libTest.nsp.so); last log line: [Error] no disk". A line that repeats the error is left out.
+std::string Phrase(std::string const& file, std::string const& error, std::string const& stage, std::string const& lastLogLine) {
+  std::string const place = (stage.empty() ? "" : stage + ", ") + file.substr(file.rfind('/') + 1);
+  bool const isNew = !lastLogLine.empty() && lastLogLine.find(error) == lastLogLine.npos;
+  return error + " (" + place + ")" + (isNew ? "; last log line: " + lastLogLine : "");
 }
 
 }  // namespace
@@ -82,10 +69,8 @@ bool TPlugIn::HasFailed() const {
 
 std::vector<TPlugIn> LoadPlugIns(std::optional<TSample> const& sample) {
   if (sample) SetForProviders(*sample);
-  std::vector<std::string> names = TOSSpecific::FindNSPs();
-  std::sort(names.begin(), names.end());
   std::vector<TPlugIn> plugIns;
-  for (std::string const& name : names) plugIns.push_back(Load(name, sample ? sample->fLabel : ""));
+  for (std::string const& name : PlugInNames()) plugIns.push_back(Load(name, sample ? sample->fLabel : ""));
   return plugIns;
 }
 
@@ -99,14 +84,30 @@ std::vector<TNamespaceView> ViewsOf(std::vector<TPlugIn> const& plugIns) {
 
 std::vector<std::string> FailuresOf(std::vector<TPlugIn> const& plugIns) {
   std::vector<std::string> failures;
-  auto const add = [&failures](std::string const& name, std::string const& error) {
-    if (!error.empty()) failures.push_back(name + ": " + error);
-  };
   for (TPlugIn const& plugIn : plugIns) {
-    add(plugIn.fName, plugIn.fError);
-    for (TProviderRun const& provider : plugIn.fProviders) add(provider.fName, provider.fError);
+    if (!plugIn.fError.empty()) failures.push_back(plugIn.fName + ": " + FailurePhraseOf(plugIn));
+    for (TProviderRun const& run : plugIn.fProviders)
+      if (!run.fError.empty()) failures.push_back(run.fName + ": " + FailurePhraseOf(plugIn, run));
   }
   return failures;
+}
+
+std::string FailurePhraseOf(TPlugIn const& plugIn) {
+  return Phrase(plugIn.fFile, plugIn.fError, plugIn.fStage, plugIn.fLastLogLine);
+}
+
+std::string FailurePhraseOf(TPlugIn const& plugIn, TProviderRun const& run) {
+  return Phrase(plugIn.fFile, run.fError, run.fStage, run.fLastLogLine);
+}
+
+std::vector<std::string> PlugInNames() {
+  std::vector<std::string> names = TOSSpecific::FindNSPs();
+  std::sort(names.begin(), names.end());
+  return names;
+}
+
+std::string PlugInFile(std::string const& name) {
+  return PlugInDirectory() + TOSSpecific::kFileSeparator + "lib" + name + kNSPExtension;
 }
 
 std::string PlugInDirectory() { return std::filesystem::path(TOSSpecific::GetZEPRootPath()).lexically_normal().string(); }

@@ -30,11 +30,19 @@ TPlugIn PlugIn(std::string const& name, std::string const& error, std::vector<TP
   return {name, "lib" + name + ".nsp.so", 0, error, providers};
 }
 
+TEST(PlugInsTest, AFailureNamesItsStageAndTheLastLogLine) {
+  TPlugIn plugIn = PlugIn("A", "file too short", {{"A1", nullptr, 0, "kZEPStatusFail", "fill", "[Error] no disk"}});
+  plugIn.fStage = "open";
+  EXPECT_EQ(FailurePhraseOf(plugIn), "file too short (open, libA.nsp.so)");
+  EXPECT_EQ(FailurePhraseOf(plugIn, plugIn.fProviders[0]), "kZEPStatusFail (fill, libA.nsp.so); last log line: [Error] no disk");
+}
+
 TEST(PlugInsTest, EachFailureIsNamed) {
   std::vector<TPlugIn> const plugIns = {PlugIn("A", "file too short", {}),
                                         PlugIn("B", "", {{"B1", nullptr, 0, "kZEPStatusFail"}, {"B2", nullptr, 0, ""}}),
                                         PlugIn("C", "", {})};
-  EXPECT_EQ(FailuresOf(plugIns), (std::vector<std::string>{"A: file too short", "B1: kZEPStatusFail"}));
+  EXPECT_EQ(FailuresOf(plugIns),
+            (std::vector<std::string>{"A: file too short (libA.nsp.so)", "B1: kZEPStatusFail (libB.nsp.so)"}));
   EXPECT_TRUE(plugIns[0].HasFailed());
   EXPECT_TRUE(plugIns[1].HasFailed());
   EXPECT_FALSE(plugIns[2].HasFailed());
@@ -64,14 +72,15 @@ protected:
 };
 
 TEST_F(PlugInDirectoryTest, APlugInThatFailsStopsNoOther) {
-  std::string const broken = "plug-in Broken: " + fDir.Path("libBroken.nsp.so") + ": file too short\n";
+  std::string const broken = "plug-in Broken: " + fDir.Path("libBroken.nsp.so") + ": file too short (open, libBroken.nsp.so)\n";
   struct TRow {
     char const *fBehaviour, *fListed;
   } const rows[] = {
-      {"works", "plug-in Test: \nprovider Test: filled root/test\n"},
-      {"throws", "plug-in Test: \nprovider Test: kZEPStatusAccessDenied\n"},
-      {"throws-a-number", "plug-in Test: \nprovider Test: it threw something that is not a std::exception\n"},
-      {"no-namespace", "plug-in Test: \nprovider Test: it has no namespace\n"},
+      {"works", "plug-in Test: \nprovider Test: filled root/test (0)\n"},
+      {"throws", "plug-in Test: \nprovider Test: kZEPStatusAccessDenied (fill, libTest.nsp.so)\n"},
+      {"throws-a-number",
+       "plug-in Test: \nprovider Test: it threw something that is not a std::exception (fill, libTest.nsp.so)\n"},
+      {"no-namespace", "plug-in Test: \nprovider Test: it has no namespace (fill, libTest.nsp.so)\n"},
       {"is-silent", "plug-in Test: \n"},
   };
   for (TRow const& row : rows) EXPECT_EQ(List(row.fBehaviour), broken + row.fListed) << row.fBehaviour;

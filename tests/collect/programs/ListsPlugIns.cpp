@@ -1,17 +1,51 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Loads the plug-ins, and prints a line for each plug-in and each provider: its failure, or the namespace that it filled.
+// Loads the plug-ins, and prints a line for each plug-in and each provider: its failure, or the namespace that it filled and its
+// instances. With --apart each plug-in has a process of its own; then these options may follow:
+//   --timeout SECONDS, --memory MEBIBYTES, --answer BYTES, --parallel NUMBER, --log
 
-#include "collect/PlugIns.h"
+#include "ICIMInstance.h"
+#include "TLogger.h"
+#include "TRootObject.h"
+#include "collect/PlugInsApart.h"
 
+#include <cstdlib>
 #include <iostream>
+#include <string>
+#include <vector>
 
 using namespace NQRVZEP20;
 
-int main() {
-  for (TPlugIn const& plugIn : LoadPlugIns()) {
-    std::cout << "plug-in " << plugIn.fName << ": " << plugIn.fError << "\n";
-    for (TProviderRun const& run : plugIn.fProviders)
-      std::cout << "provider " << run.fName << ": " << (run.fView ? "filled " + run.fView->GetName() : run.fError) << "\n";
+namespace {
+
+std::vector<TPlugIn> Load(std::vector<std::string> const& words) {
+  if (words.empty()) return LoadPlugIns();
+  TApartOptions options;
+  for (std::size_t at = 1; at + 1 < words.size(); at += 2) {
+    int const number = std::atoi(words[at + 1].c_str());
+    if (words[at] == "--timeout") options.fLimits.fTimeoutSeconds = number;
+    if (words[at] == "--memory") options.fLimits.fMemoryMebibytes = static_cast<std::uint64_t>(number);
+    if (words[at] == "--answer") options.fLimits.fAnswerBytes = static_cast<std::uint64_t>(number);
+    if (words[at] == "--parallel") options.fParallel = static_cast<std::size_t>(number);
   }
+  return LoadPlugInsApart(std::nullopt, options);
+}
+
+std::string ResultOf(TPlugIn const& plugIn, TProviderRun const& run) {
+  if (!run.fView) return FailurePhraseOf(plugIn, run);
+  return "filled " + run.fView->GetName() + " (" + std::to_string(run.fView->AllInstances().size()) + ")";
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  std::vector<std::string> const words(argv + 1, argv + argc);
+  for (TPlugIn const& plugIn : Load(words)) {
+    std::cout << "plug-in " << plugIn.fName << ": " << (plugIn.fError.empty() ? "" : FailurePhraseOf(plugIn)) << "\n";
+    for (TProviderRun const& run : plugIn.fProviders)
+      std::cout << "provider " << run.fName << ": " << ResultOf(plugIn, run) << "\n";
+    if (!plugIn.fWords.empty()) std::cout << "words " << plugIn.fName << ": " << plugIn.fWords << "\n";
+  }
+  if (!words.empty() && words.back() == "--log")
+    for (ILogger::TLogEntry const& entry : TRootObject::GetCoreLogger()->GetLog()) std::cout << "log: " << entry.fMessage << "\n";
 }

@@ -1,0 +1,41 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/process/LogLines.h"
+
+#include <regex>
+#include <sstream>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+constexpr char const* kLabels[] = {"Error", "Warning", "Status", "Debug", "Verbose"};  // by severity
+
+}  // namespace
+
+std::vector<TLogLine> LogLinesOf(std::string const& text) {
+  static std::regex const entry(R"(FDR_\[(Error|Warning|Status|Debug|Verbose)\] \d+/\d+/\d+  \d+:\d+:\d+ )");
+  std::vector<TLogLine> lines;
+  std::istringstream stream(text);
+  std::smatch match;
+  for (std::string line; std::getline(stream, line);) {
+    if (line.rfind("-- ZEP Log ", 0) == 0) continue;
+    std::string const head = line.substr(0, 48);  // longer than the head of any entry
+    if (std::regex_search(head, match, entry, std::regex_constants::match_continuous)) {
+      int severity = 0;
+      while (kLabels[severity] != match[1]) ++severity;
+      lines.push_back({static_cast<ILogger::EZEPLogSeverity>(severity), line.substr(static_cast<std::size_t>(match.length()))});
+    } else if (!lines.empty()) {
+      lines.back().fMessage += "\n" + line;
+    }
+  }
+  return lines;
+}
+
+std::string LastLogLineOf(std::string const& text) {
+  std::vector<TLogLine> const lines = LogLinesOf(text);
+  if (lines.empty()) return "";
+  std::string const& message = lines.back().fMessage;
+  return "[" + std::string(kLabels[lines.back().fSeverity]) + "] " + message.substr(0, message.find('\n'));
+}
+
+}  // namespace NQRVZEP20

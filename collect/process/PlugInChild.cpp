@@ -1,0 +1,197 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/process/PlugInChild.h"
+
+#include "ILogger.h"
+#include "TOSSpecific.h"
+#include "TRootObject.h"
+#include "collect/answer/NamespaceBytes.h"
+#include "collect/process/Descriptors.h"
+#include "collect/process/EStage.h"
+#include "collect/process/Messages.h"
+#include "collect/process/SharedObject.h"
+#include "collect/process/TWatchedRegistry.h"
+#include "collect/process/TimedFailure.h"
+
+#include <fcntl.h>
+#include <stdlib.h>
+#include <sys/prctl.h>
+#include <sys/resource.h>
+#include <unistd.h>
+#include <boost/make_shared.hpp>
+
+#include <algorithm>
+#include <cerrno>
+#include <cstdio>
+#include <exception>
+#include <fstream>
+#include <iostream>
+#include <mutex>
+#include <stdexcept>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+// ---- Messages. Of the process alone: a copy of it that the plug-in forks sends nothing. ----
+
+int gAnswer = -1;
+pid_t gProcess = 0;
+std::recursive_mutex gSending;  // threads of the plug-in may end the process
+
+bool IsCopy() { return ::getpid() != gProcess; }
+
+// A plug-in that closed the descriptor is waited for no longer: its owner sees that the pipe is closed, and ends this process.
+void WriteWhole(std::string_view bytes) {
+  while (!bytes.empty()) {
+    ssize_t const count = ::write(gAnswer, bytes.data(), bytes.size());
+    if (count < 0 && errno == EINTR) continue;
+    while (count < 0) ::pause();
+    bytes.remove_prefix(static_cast<std::size_t>(count));
+  }
+}
+
+void Send(EMessage kind, std::string_view text) {
+  if (IsCopy()) ::_exit(0);  // it returned from the plug-in's code
+  std::lock_guard const lock(gSending);
+  while (text.size() > kLongestMessage && kind == EMessage::kBytes) {
+    Send(kind, text.substr(0, kLongestMessage));
+    text.remove_prefix(kLongestMessage);
+  }
+  std::string_view const sent = text.substr(0, kLongestMessage);
+  WriteWhole(HeadOf(kind, sent.size()));
+  WriteWhole(sent);
+}
+
+void SendStage(EStage stage) { Send(EMessage::kStage, std::string(1, static_cast<char>(stage))); }
+
+void FlushWords() {
+  std::cout.flush();
+  std::cerr.flush();
+  std::fflush(stdout);
+}
+
+// ---- The ways in which a plug-in can end the process ----
+
+void OnExit(int status, void*) {
+  if (IsCopy()) ::_exit(status);
+  FlushWords();
+  Send(EMessage::kExits, std::to_string(status));
+  ::_exit(status);
+}
+
+// For an exception that nothing can catch: of a static constructor, a thread or a function that is declared not to throw.
+[[noreturn]] void OnTerminate() {
+  if (IsCopy()) ::_exit(1);
+  std::string why = "it called std::terminate";
+  if (auto const thrown = std::current_exception()) why = FailureOf([&] { std::rethrow_exception(thrown); });
+  FlushWords();
+  Send(EMessage::kFatal, why);
+  ::_exit(1);
+}
+
+// ---- Setting up ----
+
+// High enough that a plug-in does not get its number by chance, and that loops that close the usual descriptors end before it.
+int MoveUp(int fd) {
+  constexpr rlim_t kHigh = 1000, kMargin = 16;
+  rlimit limit{};
+  ::getrlimit(RLIMIT_NOFILE, &limit);
+  int const high = static_cast<int>(std::min(kHigh, limit.rlim_cur > kMargin ? limit.rlim_cur - kMargin : 0));
+  int const moved = ::fcntl(fd, F_DUPFD_CLOEXEC, high);
+  return moved >= 0 ? moved : fd;
+}
+
+// The log of this thread goes to the pipe. Without /proc it goes nowhere.
+void RedirectLog(int fd) {
+  FailureOf([&] { TRootObject::GetCoreLogger()->SetLogFilename("/proc/self/fd/" + std::to_string(fd)); });
+  ::close(fd);
+}
+
+void WriteNoCoreDump() {
+  rlimit const none{0, 0};
+  ::setrlimit(RLIMIT_CORE, &none);
+  ::prctl(PR_SET_DUMPABLE, 0);  // the system may pass a dump to a program, whatever the limit is
+}
+
+void LimitMemory(std::uint64_t bytes) {
+  if (bytes == 0) return;
+  std::uint64_t pages = 0;
+  std::ifstream("/proc/self/statm") >> pages;
+  rlim_t const most = pages * static_cast<std::uint64_t>(::sysconf(_SC_PAGESIZE)) + bytes;
+  rlimit const limit{most, most};
+  ::setrlimit(RLIMIT_AS, &limit);
+}
+
+void SetUp(TChildSetup const& setup) {
+  gProcess = ::getpid();
+  MakeNull(STDIN_FILENO);
+  ::dup2(setup.fWords, STDOUT_FILENO);
+  ::dup2(setup.fWords, STDERR_FILENO);
+  gAnswer = MoveUp(setup.fAnswer);
+  CloseAllBut({gAnswer, setup.fLog});
+  RedirectLog(setup.fLog);
+  std::setvbuf(stdout, nullptr, _IOLBF, 0);  // words that a plug-in prints before it crashes are not lost
+  WriteNoCoreDump();
+  LimitMemory(setup.fMemoryBytes);
+  std::set_terminate(OnTerminate);
+  ::on_exit(OnExit, nullptr);
+}
+
+// ---- Load and fill ----
+
+boost::shared_ptr<TWatchedRegistry> WatchRegistry() {
+  auto const registry = boost::make_shared<TWatchedRegistry>(TNamespaceProviderManager::GetInstance(),
+                                                             TWatchedRegistry::TEvents{[] { SendStage(EStage::kRegistration); },
+                                                                                       [](std::string const& name) {
+                                                                                         Send(EMessage::kRegistered, name);
+                                                                                         SendStage(EStage::kConstruction);
+                                                                                       },
+                                                                                       [](std::string const& name) {
+                                                                                         Send(EMessage::kTaken, name);
+                                                                                         SendStage(EStage::kConstruction);
+                                                                                       }});
+  TNamespaceProviderManager::fgInstance = registry;
+  return registry;
+}
+
+void Load(TChildSetup const& setup) {
+  SendStage(EStage::kOpen);
+  bool const runsItsCode = CanBeMapped(setup.fFile);
+  if (runsItsCode) SendStage(EStage::kConstruction);
+  TTimedFailure const failure = TimedFailureOf([&] { TOSSpecific::LoadNSPLibrary(setup.fName); });
+  if (!failure.fMessage.empty()) {
+    SendStage(EStage::kOpen);  // an exception of the plug-in ends in OnTerminate
+    Send(EMessage::kFailed, failure.ReasonOrMessage());
+  }
+  Send(EMessage::kLoaded, std::to_string(failure.fMilliseconds));
+}
+
+void Fill(INamespaceProvider& provider) {
+  Send(EMessage::kFilling, provider.GetName(TCIMContext()));
+  boost::shared_ptr<ICIMNamespace> ns;
+  TTimedFailure failure = TimedFailureOf([&] {
+    ns = provider.GetNamespace(TCIMContext());
+    if (!ns) throw std::runtime_error("it has no namespace");
+  });
+  double const milliseconds = failure.fMilliseconds;
+  if (failure.fMessage.empty())
+    failure = TimedFailureOf([&] { WriteNamespace(*ns, [](std::string_view bytes) { Send(EMessage::kBytes, bytes); }); });
+  if (failure.fMessage.empty())
+    Send(EMessage::kFilled, std::to_string(milliseconds));
+  else
+    Send(EMessage::kFailed, failure.MessageAndReason());
+}
+
+}  // namespace
+
+void RunPlugIn(TChildSetup const& setup) {
+  SetUp(setup);
+  auto const registry = WatchRegistry();
+  Load(setup);
+  for (auto const& provider : registry->NewProviders()) Fill(*provider);
+  FlushWords();
+  Send(EMessage::kDone, "");
+  ::_exit(0);
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,13 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <string>
+
+namespace NQRVZEP20 {
+
+// Whether the file is a shared object that can be mapped completely: a regular, readable ELF file of this machine's word size
+// whose segments end within the file. The dynamic linker may still refuse it, for example for a missing symbol; but a process
+// that dies while it loads such a file dies in code of the file.
+bool CanBeMapped(std::string const& file);
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,121 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/process/Supervisor.h"
+
+#include "collect/process/Descriptors.h"
+
+#include <poll.h>
+#include <signal.h>
+#include <sys/prctl.h>
+#include <sys/signalfd.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdlib>
+#include <fstream>
+#include <string>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+void ResetSignals() {
+  for (int signal = 1; signal < NSIG; ++signal) ::signal(signal, SIG_DFL);
+  sigset_t none;
+  ::sigemptyset(&none);
+  ::sigprocmask(SIG_SETMASK, &none, nullptr);
+}
+
+// A signal for the child's end can be polled.
+TUniqueFd BlockAndWatchChildren() {
+  sigset_t children;
+  ::sigemptyset(&children);
+  ::sigaddset(&children, SIGCHLD);
+  ::sigprocmask(SIG_BLOCK, &children, nullptr);
+  return TUniqueFd(::signalfd(-1, &children, SFD_CLOEXEC | SFD_NONBLOCK));
+}
+
+[[noreturn]] void BeChild(pid_t supervisor, std::function<void()> const& work) {
+  ::setsid();
+  ResetSignals();
+  ::prctl(PR_SET_PDEATHSIG, SIGKILL);
+  if (::getppid() != supervisor) ::_exit(1);  // it died before the call
+  work();
+  ::_exit(0);
+}
+
+class TSupervised {
+public:
+  explicit TSupervised(pid_t child) : fChild(child), fVerdict{0, false} {}
+
+  // Reaps the child, and orphans that became children. True when the child has ended.
+  bool HasEnded() {
+    int status = 0;
+    for (pid_t ended; !fHasEnded && (ended = ::waitpid(-1, &status, WNOHANG)) > 0;) Note(ended, status);
+    return fHasEnded;
+  }
+
+  // Ends every child. The children of an ended one become children of this process, and are ended in their turn.
+  void EndAll() {
+    fVerdict.fHadEndedByItself = HasEnded();
+    int status = 0;
+    while (true) {
+      pid_t ended = ::waitpid(-1, &status, WNOHANG);
+      if (ended == 0) {
+        KillChildren();
+        ended = ::waitpid(-1, &status, 0);
+      }
+      if (ended > 0) Note(ended, status);
+      if (ended < 0 && errno == ECHILD) return;
+    }
+  }
+
+  TVerdict const& Verdict() const { return fVerdict; }
+
+private:
+  void Note(pid_t ended, int status) {
+    if (ended != fChild) return;
+    fHasEnded = true;
+    fVerdict.fStatus = status;
+  }
+
+  // A child may be stopped. The list is missing on a kernel that was built without it; then only the plug-in itself is ended.
+  void KillChildren() const {
+    std::string const self = std::to_string(::getpid());
+    std::ifstream children("/proc/self/task/" + self + "/children");
+    if (!fHasEnded) ::kill(fChild, SIGKILL);
+    for (pid_t child; children >> child;) ::kill(child, SIGKILL);
+  }
+
+  pid_t const fChild;
+  bool fHasEnded = false;
+  TVerdict fVerdict;
+};
+
+}  // namespace
+
+void Supervise(TSupervisorEnds const& ends, std::function<void()> const& work) {
+  ::setsid();
+  ResetSignals();
+  ::prctl(PR_SET_CHILD_SUBREAPER, 1);
+  TUniqueFd const ended = BlockAndWatchChildren();
+  pid_t const supervisor = ::getpid();
+  pid_t const child = ::fork();
+  if (child == 0) BeChild(supervisor, work);
+  if (child < 0) ::_exit(1);  // the owner gets no verdict
+
+  for (int const fd : {0, 1, 2}) MakeNull(fd);
+  CloseAllBut({ends.fControl, ends.fVerdict, ended.get()});
+  TSupervised supervised(child);
+  pollfd polled[] = {{ends.fControl, POLLIN, 0}, {ended.get(), POLLIN, 0}};
+  while (!supervised.HasEnded() && polled[0].revents == 0) {
+    ::poll(polled, 2, -1);
+    signalfd_siginfo ignored;
+    while (::read(ended.get(), &ignored, sizeof ignored) > 0) continue;
+  }
+  supervised.EndAll();
+  [[maybe_unused]] ssize_t const sent = ::write(ends.fVerdict, &supervised.Verdict(), sizeof(TVerdict));
+  ::_exit(0);
+}
+
+}  // namespace NQRVZEP20

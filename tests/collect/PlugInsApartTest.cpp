@@ -1,0 +1,226 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/PlugInsApart.h"
+
+#include "tests/Support.h"
+#include "tests/collect/SamplePlugIns.h"
+#include "tests/collect/answer/DumpOf.h"
+
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <signal.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <memory>
+
+namespace NQRVZEP20 {
+namespace {
+
+namespace fs = std::filesystem;
+using testing::AllOf;
+using testing::Contains;
+using testing::HasSubstr;
+using testing::StartsWith;
+
+using TLines = std::vector<std::string>;
+
+// ---- The same answers as in this process ----
+
+TEST(PlugInsApartTest, TheAnswersAreThoseOfThePlugInsInThisProcess) {
+  auto const apart = LoadPlugInsApart(TheSample());  // first: a plug-in that is loaded here registers only once
+  auto const& here = SamplePlugIns();
+  ASSERT_EQ(apart.size(), here.size());
+  for (std::size_t n = 0; n < here.size(); ++n) {
+    EXPECT_EQ(apart[n].fName, here[n].fName);
+    EXPECT_EQ(apart[n].fFile, here[n].fFile);
+    EXPECT_FALSE(apart[n].HasFailed());
+    ASSERT_EQ(apart[n].fProviders.size(), here[n].fProviders.size());
+    for (std::size_t m = 0; m < here[n].fProviders.size(); ++m) {
+      TNamespaceView const &one = *apart[n].fProviders[m].fView, &other = *here[n].fProviders[m].fView;
+      EXPECT_EQ(one.GetProviderName(), other.GetProviderName());
+      EXPECT_EQ(one.GetSampleLabel(), other.GetSampleLabel());
+      EXPECT_EQ(DumpOf(*one.Get()), DumpOf(*other.Get()));
+      EXPECT_GT(apart[n].fProviders[m].fMilliseconds, 0);
+    }
+  }
+}
+
+// ---- Plug-ins that misbehave ----
+
+class PlugInsApartMisdeedTest : public testing::Test {
+protected:
+  PlugInsApartMisdeedTest() { fs::copy(TEST_LIBZEPCORE, fDir.Path("libzepcore.so")); }
+
+  void Add(std::vector<std::string> const& names) {
+    for (std::string const& name : names) fs::copy(MISBEHAVES, fDir.Path("lib" + name + ".nsp.so"));
+  }
+
+  std::string Environment() const { return "LD_LIBRARY_PATH=" + fDir.Path() + " ZEP_MISDEEDS=" + fDir.Path() + " "; }
+
+  TLines List(std::string const& options) const {
+    std::string const command = Environment() + LISTS_PLUG_INS + " --apart " + options + " 2>&1";
+    std::unique_ptr<FILE, int (*)(FILE*)> const pipe(::popen(command.c_str(), "r"), ::pclose);
+    TLines lines(1);
+    for (int c; (c = std::fgetc(pipe.get())) != EOF;)
+      if (c == '\n')
+        lines.emplace_back();
+      else
+        lines.back() += static_cast<char>(c);
+    return lines;
+  }
+
+  // "provider Crashes: why (fill, libCrashes.nsp.so)", with the part after it.
+  static std::string InFill(std::string const& name, std::string const& why, std::string const& end = "") {
+    return "provider " + name + ": " + why + " (fill, lib" + name + ".nsp.so)" + end;
+  }
+  static std::string InLoad(std::string const& name, std::string const& why, std::string const& stage) {
+    return "plug-in " + name + ": " + why + " (" + stage + ", lib" + name + ".nsp.so)";
+  }
+  static std::string Filled(std::string const& name) { return "provider " + name + ": filled root/" + name + " (1)"; }
+
+  // Waits until the process of the file has ended.
+  void ExpectNoProcess(std::string const& file) const {
+    std::string const id = ReadFile(fDir.Path(file));
+    ASSERT_FALSE(id.empty()) << file;
+    for (int tries = 0; fs::exists("/proc/" + id) && tries < 6000; ++tries) ::usleep(10000);
+    EXPECT_FALSE(fs::exists("/proc/" + id)) << file;
+  }
+
+  TTempDir const fDir;
+};
+
+TEST_F(PlugInsApartMisdeedTest, APlugInThatDiesCostsOnlyItsOwnRow) {
+  TLines const expected = {
+      InFill("Throws", "kZEPStatusAccessDenied (no disk)", "; last log line: [Error] the disk is gone"),
+      InFill("ThrowsInAThread", "in a thread"),
+      InFill("ThrowsWhileItMayNot", "it may not"),
+      InFill("Crashes", "it was ended by SIGSEGV (Segmentation fault)", "; last log line: [Error] about to crash"),
+      InFill("Aborts", "it was ended by SIGABRT (Aborted)"),
+      InFill("Exits", "it ended the process with status 0"),
+      InFill("ExitsAtOnce", "it ended the process with status 7"),
+      InFill("Executes", "it ended the process with status 9"),
+      InFill("Kills", "it was ended by SIGTERM (Terminated)"),
+      InFill("Closes", "it closed the descriptor of its answer"),
+      InLoad("LoadThrows", "no disk today", "static construction"),
+      InLoad("LoadThrowsANumber", "it threw something that is not a std::exception", "static construction"),
+      InLoad("LoadCrashes", "it was ended by SIGSEGV (Segmentation fault)", "static construction"),
+      InLoad("LoadExits", "it ended the process with status 3", "static construction"),
+      InLoad("LoadAborts", "it was ended by SIGABRT (Aborted)", "static construction"),
+      InLoad("LoadCloses", "it closed the descriptor of its answer", "static construction"),
+      InLoad("RegistrationThrows", "it has no name", "registration"),
+      InLoad("Broken", fDir.Path("libBroken.nsp.so") + ": file too short", "open"),
+      Filled("Healthy"),
+  };
+  Add({"Throws", "ThrowsInAThread", "ThrowsWhileItMayNot", "Crashes", "Aborts", "Exits", "ExitsAtOnce", "Executes", "Kills",
+       "Closes", "LoadThrows", "LoadThrowsANumber", "LoadCrashes", "LoadExits", "LoadAborts", "LoadCloses", "RegistrationThrows",
+       "Healthy"});
+  WriteFile(fDir.Path("libBroken.nsp.so"), "this is not a library");
+  TLines const lines = List("");
+  for (std::string const& line : expected) EXPECT_THAT(lines, Contains(line));
+}
+
+TEST_F(PlugInsApartMisdeedTest, APlugInThatHangsIsEndedWithAllThatItStarted) {
+  TLines const expected = {
+      InFill("Hangs", "it exceeded the time limit of 3 s"),
+      "provider HangsAfter: not filled, because the process of the plug-in had ended (fill, libHangs.nsp.so)",
+      InFill("HangsBlocked", "it exceeded the time limit of 3 s"),
+      InFill("Stops", "it exceeded the time limit of 3 s"),
+      InLoad("LoadHangs", "it exceeded the time limit of 3 s", "static construction"),
+      InLoad("RegistrationHangs", "it exceeded the time limit of 3 s", "registration"),
+  };
+  Add({"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs"});
+  TLines const lines = List("--timeout 3 --parallel 8");
+  for (std::string const& line : expected) EXPECT_THAT(lines, Contains(line));
+  ExpectNoProcess("Hangs");
+  ExpectNoProcess("HangsBlocked");
+}
+
+TEST_F(PlugInsApartMisdeedTest, ProcessesThatAPlugInLeavesAreEnded) {
+  Add({"Forks", "ForksTwice"});
+  TLines const lines = List("");
+  EXPECT_THAT(lines, Contains(Filled("Forks")));
+  EXPECT_THAT(lines, Contains(Filled("ForksTwice")));
+  ExpectNoProcess("Forks");
+}
+
+TEST_F(PlugInsApartMisdeedTest, NoProcessOutlivesTheOwner) {
+  Add({"Hangs"});
+  for (int const signal : {SIGKILL, SIGINT}) {
+    fs::remove(fDir.Path("Hangs"));
+    pid_t const owner = ::fork();
+    if (owner == 0) {
+      ::setenv("LD_LIBRARY_PATH", fDir.Path().c_str(), 1);
+      ::setenv("ZEP_MISDEEDS", fDir.Path().c_str(), 1);
+      ::execl(LISTS_PLUG_INS, LISTS_PLUG_INS, "--apart", nullptr);
+      ::_exit(127);
+    }
+    for (int tries = 0; ReadFile(fDir.Path("Hangs")).empty() && tries < 6000; ++tries) ::usleep(10000);
+    ::kill(owner, signal);
+    ::waitpid(owner, nullptr, 0);
+    ExpectNoProcess("Hangs");
+  }
+}
+
+TEST_F(PlugInsApartMisdeedTest, AnEndlessAnswerIsCutOff) {
+  Add({"AnswersForever", "AnswersBroken"});
+  TLines const lines = List("--answer 100000");
+  EXPECT_THAT(lines, Contains(InFill("AnswersForever", "its answer exceeds 100000 bytes")));
+  EXPECT_THAT(lines, Contains("provider AnswersBroken: filled root/own (1)"));
+}
+
+TEST_F(PlugInsApartMisdeedTest, TheMemoryLimitEndsAPlugInThatFillsMemory) {
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer reserves more address space than any limit";
+  Add({"FillsMemory", "Healthy"});
+  TLines const lines = List("--memory 64");
+  EXPECT_THAT(lines, Contains(InFill("FillsMemory", "std::bad_alloc (the memory limit is 64 MiB)")));
+  EXPECT_THAT(lines, Contains(Filled("Healthy")));
+}
+
+TEST_F(PlugInsApartMisdeedTest, WordsOfAPlugInAreCaught) {
+  Add({"Prints", "PrintsMuch", "CrashesAfterWords", "Reads"});
+  TLines const lines = List("");
+  EXPECT_THAT(lines, Contains("words Prints: words of 17 bytes"));
+  EXPECT_THAT(lines, Contains("and more"));
+  EXPECT_THAT(lines, Contains("words PrintsMuch: line 0"));
+  EXPECT_THAT(lines, Contains(testing::MatchesRegex("\\[[0-9]+ bytes are left out\\]")));
+  EXPECT_THAT(lines, Contains("line 99999"));
+  EXPECT_THAT(lines, Contains("words CrashesAfterWords: last words"));
+  EXPECT_THAT(lines, Contains("words Reads: read -1"));
+}
+
+TEST_F(PlugInsApartMisdeedTest, ChangesOfAProcessStayInIt) {
+  Add({"ChangesDirectory", "LimitsItself", "Healthy"});
+  TLines const lines = List("--parallel 1");
+  for (char const* name : {"ChangesDirectory", "LimitsItself", "Healthy"}) EXPECT_THAT(lines, Contains(Filled(name)));
+}
+
+TEST_F(PlugInsApartMisdeedTest, OfTwoProvidersWithOneNameTheFirstCounts) {
+  Add({"TwinA", "TwinB", "RegistersTwice", "RegistersNothing"});
+  TLines const lines = List("");
+  EXPECT_THAT(lines, Contains("provider Twin: filled root/TwinA (1)"));
+  EXPECT_THAT(lines, Contains("provider Twin: the name Twin is registered by libTwinA.nsp.so, which comes first (registration, "
+                              "libTwinB.nsp.so)"));
+  EXPECT_THAT(lines, Contains(Filled("RegistersTwice")));
+  EXPECT_THAT(lines, Contains("provider RegistersTwice: the plug-in registers this name twice; the first one counts "
+                              "(registration, libRegistersTwice.nsp.so)"));
+  EXPECT_THAT(lines, Contains("plug-in RegistersNothing: "));
+}
+
+TEST_F(PlugInsApartMisdeedTest, WhatAPlugInLogsIsLoggedHere) {
+  Add({"Throws", "Crashes"});
+  TLines const lines = List("--log");
+  EXPECT_THAT(lines, Contains("log: about to crash"));
+  EXPECT_THAT(lines, Contains("log: the disk is gone"));
+}
+
+TEST_F(PlugInsApartMisdeedTest, ResultsAreInTheOrderOfTheNames) {
+  Add({"Healthy", "A", "Z", "M", "Exits"});
+  TLines plugIns;
+  for (std::string const& line : List("--parallel 3"))
+    if (line.rfind("plug-in ", 0) == 0) plugIns.push_back(line);
+  EXPECT_EQ(plugIns, (TLines{"plug-in A: ", "plug-in Exits: ", "plug-in Healthy: ", "plug-in M: ", "plug-in Z: "}));
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,254 @@
+// SPDX-License-Identifier: Apache-2.0
+
+// A provider plug-in that does what its own file name states: libCrashes.nsp.so crashes while it fills its namespace. Copy it
+// under the names of the functions below. Files that it writes are in the directory that ZEP_MISDEEDS names.
+
+#include "ICIMClass.h"
+#include "ILogger.h"
+#include "TNamespaceProviderManager.h"
+#include "TRootObject.h"
+#include "TZEPFailure.h"
+#include "providers/memory/TMemoryClass.h"
+#include "providers/memory/TMemoryNamespace.h"
+#include "providers/memory/TMemoryProvider.h"
+
+#include <dlfcn.h>
+#include <fcntl.h>
+#include <sys/mman.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
+#include <boost/make_shared.hpp>
+
+#include <csignal>
+#include <cstdio>
+#include <cstdlib>
+#include <fstream>
+#include <iostream>
+#include <map>
+#include <stdexcept>
+#include <thread>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+// "Crashes" for libCrashes.nsp.so.
+std::string OwnName() {
+  Dl_info info{};
+  ::dladdr(reinterpret_cast<void*>(&OwnName), &info);
+  std::string const file = info.dli_fname;
+  std::size_t const start = file.rfind('/') + 4;
+  return file.substr(start, file.find('.', start) - start);
+}
+
+std::string FileOf(std::string const& name) { return std::string(std::getenv("ZEP_MISDEEDS")) + "/" + name; }
+
+void LeaveProcessId(std::string const& name) { std::ofstream(FileOf(name)) << ::getpid() << std::flush; }
+
+void Log(char const* message) { TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, message); }
+
+[[noreturn]] void ThrowHere(char const* text) { throw std::runtime_error(text); }
+
+[[noreturn]] void HangHere() {
+  while (true) ::pause();
+}
+
+void Crash() {
+  void* const page = ::mmap(nullptr, 4096, PROT_NONE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+  *static_cast<char volatile*>(page) = 1;
+}
+
+// A process in a session of its own, which holds every descriptor.
+void StartDaemon(std::string const& name) {
+  if (::fork() == 0) {
+    ::setsid();
+    if (::fork() == 0) {
+      LeaveProcessId(name);
+      HangHere();
+    }
+    ::_exit(0);
+  }
+  ::wait(nullptr);
+  struct stat status {};
+  while (::stat(FileOf(name).c_str(), &status) != 0 || status.st_size == 0) ::usleep(1000);
+}
+
+void FillMemory() {
+  for (std::size_t size = 1024 * 1024;; size += 1024 * 1024) {
+    char volatile* const piece = new char volatile[size];
+    for (std::size_t at = 0; at < size; at += 4096) piece[at] = 1;
+  }
+}
+
+// Enumerates one instance for ever.
+class TEndlessClass : public TMemoryClass {
+public:
+  using TMemoryClass::TMemoryClass;
+  void EnumerateInstances(boost::function<bool(boost::shared_ptr<ICIMInstance>)> callback,
+                          TCIMContext const& context) const override {
+    TMemoryClass::EnumerateInstances(
+        [&](boost::shared_ptr<ICIMInstance> instance) {
+          while (callback(instance)) continue;
+          return false;
+        },
+        context);
+  }
+};
+
+class TOwnNamespace : public TMemoryNamespace {
+public:
+  using TMemoryNamespace::TMemoryNamespace;
+  boost::shared_ptr<ICIMClass> fClass;
+  void EnumerateClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)> callback, TCIMContext const&) const override {
+    callback(fClass);
+  }
+};
+
+// Its first class has a value of a type that does not exist, and a name that is not a name.
+class TBrokenProperty : public ICIMProperty {
+public:
+  explicit TBrokenProperty(boost::shared_ptr<ICIMProperty> property) : fProperty(property) {}
+  TCIMValue GetValue(TCIMContext const&) const override {
+    TCIMValue value;
+    value.SetNullValue(static_cast<TCIMValue::TCIMType::ECIMType>(77777), 0);
+    return value;
+  }
+  void SetValue(TCIMValue const&, TCIMContext const&) override {}
+  std::string GetName(TCIMContext const&) const override { return "no name: \xff"; }
+  boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(TCIMContext const& context) const override {
+    return fProperty->GetDeclaration(context);
+  }
+
+private:
+  boost::shared_ptr<ICIMProperty> const fProperty;
+};
+
+class TBrokenInstance : public TMemoryInstance {
+public:
+  using TMemoryInstance::TMemoryInstance;
+  void EnumerateProperties(boost::function<bool(boost::shared_ptr<ICIMProperty>)> callback,
+                           TCIMContext const& context) const override {
+    TMemoryInstance::EnumerateProperties(
+        [&](boost::shared_ptr<ICIMProperty> property) { return callback(boost::make_shared<TBrokenProperty>(property)); },
+        context);
+  }
+};
+
+class TBrokenClass : public TMemoryClass {
+public:
+  using TMemoryClass::TMemoryClass;
+  void EnumerateInstances(boost::function<bool(boost::shared_ptr<ICIMInstance>)> callback, TCIMContext const&) const override {
+    auto const self = boost::const_pointer_cast<TMemoryClass>(boost::static_pointer_cast<TMemoryClass const>(shared_from_this()));
+    auto const layout = boost::make_shared<TMemoryLayout>();
+    layout->fDecls.Add(boost::const_pointer_cast<TMemoryPropertyDecl const>(self->FindPropertyDecl("Id")));
+    callback(boost::make_shared<TBrokenInstance>(self, layout));
+  }
+};
+
+template <class TClass>
+boost::shared_ptr<TMemoryNamespace> NamespaceWith() {
+  auto const ns = boost::make_shared<TOwnNamespace>("root/own");
+  auto const cls = boost::make_shared<TClass>(ns, nullptr, "X_Own");
+  ns->fClass = cls;
+  cls->AddPropertyDecl("Id", TCIMValue(TCIMValue::TCIMType::kCIMTypeUint32, 0), TCIMContext());
+  cls->AddInstance({{"Id", 1}});
+  return ns;
+}
+
+using TMisdeed = void (*)();
+
+std::map<std::string, TMisdeed> const kWhileLoading = {
+    {"LoadThrows", [] { throw std::runtime_error("no disk today"); }},
+    {"LoadThrowsANumber", [] { throw 5; }},
+    {"LoadCrashes", Crash},
+    {"LoadExits", [] { std::exit(3); }},
+    {"LoadHangs", [] { HangHere(); }},
+    {"LoadAborts", [] { std::abort(); }},
+    {"LoadCloses",
+     [] {
+       for (int fd = 0; fd < 4096; ++fd) ::close(fd);
+     }},
+};
+
+std::map<std::string, TMisdeed> const kWhileFilling = {
+    {"Throws", [] { Log("the disk is gone"), throw TZEPFailure(kZEPStatusAccessDenied, "no disk"); }},
+    {"ThrowsInAThread", [] { std::thread([] { throw std::runtime_error("in a thread"); }).join(); }},
+    {"ThrowsWhileItMayNot", []() noexcept { ThrowHere("it may not"); }},
+    {"Crashes", [] { Log("about to crash"), Crash(); }},
+    {"CrashesAfterWords", [] { std::cout << "last words" << std::endl, Crash(); }},
+    {"Aborts", [] { std::abort(); }},
+    {"Exits", [] { std::exit(0); }},
+    {"ExitsAtOnce", [] { ::_exit(7); }},
+    {"Executes", [] { ::execl("/bin/sh", "sh", "-c", "exit 9", nullptr); }},
+    {"Hangs", [] { StartDaemon("Hangs"), HangHere(); }},
+    {"HangsBlocked",
+     [] {
+       sigset_t all;
+       ::sigfillset(&all);
+       ::sigprocmask(SIG_BLOCK, &all, nullptr);
+       for (int signal = 1; signal < 32; ++signal) std::signal(signal, SIG_IGN);
+       LeaveProcessId("HangsBlocked");
+       HangHere();
+     }},
+    {"Stops", [] { ::raise(SIGSTOP); }},
+    {"Kills", [] { ::kill(0, SIGTERM); }},
+    {"FillsMemory", FillMemory},
+    {"Closes",
+     [] {
+       for (int fd = 0; fd < 4096; ++fd) ::close(fd);
+     }},
+    {"Prints", [] { std::printf("words of %d bytes\n", 17), std::cerr << "and more" << std::endl; }},
+    {"PrintsMuch",
+     [] {
+       for (int n = 0; n < 100000; ++n) std::printf("line %d\n", n);
+     }},
+    {"ChangesDirectory", [] { [[maybe_unused]] int const status = ::chdir("/"); }},
+    {"Forks", [] { StartDaemon("Forks"); }},
+    {"ForksTwice", [] { [[maybe_unused]] pid_t const copy = ::fork(); }},
+    {"Reads", [] { std::cout << "read " << std::cin.get() << std::endl; }},
+    {"LimitsItself", [] { ::umask(0777), ::setenv("ZEP_HOST_NAME", "wrong", 1); }},
+};
+
+void Fill(TMemoryNamespace& ns) {
+  auto const misdeed = kWhileFilling.find(OwnName());
+  if (misdeed != kWhileFilling.end()) misdeed->second();
+  ns.DefineClass("X_" + OwnName()).Key("Id", "uint32");
+  ns.AddInstance("X_" + OwnName(), {{"Id", 1}});
+}
+
+class TProvider : public TMemoryProvider {
+public:
+  using TMemoryProvider::TMemoryProvider;
+  std::string const& GetName(TCIMContext const& context) const override {
+    if (OwnName() == "RegistrationThrows") throw std::runtime_error("it has no name");
+    if (OwnName() == "RegistrationHangs") HangHere();
+    return TMemoryProvider::GetName(context);
+  }
+  boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) override {
+    if (OwnName() == "AnswersForever") return NamespaceWith<TEndlessClass>();
+    if (OwnName() == "AnswersBroken") return NamespaceWith<TBrokenClass>();
+    return TMemoryProvider::GetNamespace(context);
+  }
+};
+
+void Register(std::string const& name) {
+  TNamespaceProviderManager::GetInstance()->RegisterNamespaceProvider(
+      boost::make_shared<TProvider>(name, "root/" + OwnName(), Fill));
+}
+
+struct TRegistration {
+  TRegistration() {
+    auto const misdeed = kWhileLoading.find(OwnName());
+    if (misdeed != kWhileLoading.end()) misdeed->second();
+    if (OwnName() == "RegistersNothing") return;
+    bool const isTwin = OwnName().rfind("Twin", 0) == 0;
+    Register(isTwin ? "Twin" : OwnName());
+    if (OwnName() == "RegistersTwice") Register(OwnName());
+    if (OwnName() == "Hangs") Register("HangsAfter");
+  }
+} const gRegistration;
+
+}  // namespace
+
+}  // namespace NQRVZEP20

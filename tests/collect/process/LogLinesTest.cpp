@@ -1,0 +1,35 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/process/LogLines.h"
+
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20 {
+namespace {
+
+constexpr char const* kLog =
+    "-- ZEP Log Opened ----------------------------\n"
+    "FDR_[Status] 3/3/2024  9:5:7 Collecting inventory\n"
+    "FDR_[Error] 13/12/2024  19:15:17 no disk\nsecond line\n"
+    "FDR_[Other] 3/3/2024  9:5:7 third line\n"
+    "FDR_[Debug] 3/3/2024  9:5:7 \n";
+
+TEST(LogLinesTest, EachEntryHasItsSeverityAndMessage) {
+  auto const lines = LogLinesOf(kLog);
+  ASSERT_EQ(lines.size(), 3u);
+  EXPECT_EQ(lines[0].fSeverity, ILogger::kLogStatus);
+  EXPECT_EQ(lines[0].fMessage, "Collecting inventory");
+  EXPECT_EQ(lines[1].fSeverity, ILogger::kLogError);
+  EXPECT_EQ(lines[1].fMessage, "no disk\nsecond line\nFDR_[Other] 3/3/2024  9:5:7 third line");
+  EXPECT_EQ(lines[2].fSeverity, ILogger::kLogDebug);
+  EXPECT_EQ(lines[2].fMessage, "");
+}
+
+TEST(LogLinesTest, TheLastLineIsThatOfTheLastEntry) {
+  EXPECT_EQ(LastLogLineOf(kLog), "[Debug] ");
+  EXPECT_EQ(LastLogLineOf("FDR_[Error] 3/3/2024  9:5:7 no disk\nsecond line\n"), "[Error] no disk");
+  EXPECT_EQ(LastLogLineOf("no entry\n"), "");
+  EXPECT_EQ(LastLogLineOf(""), "");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20
