@@ -2,6 +2,7 @@
 
 // A front end in a few lines: loads the provider plug-ins, makes the report, and prints it in its own way.
 
+#include "collect/PlugInsApart.h"
 #include "collect/Report.h"
 #include "collect/SafeText.h"
 
@@ -10,7 +11,7 @@
 using namespace NQRVZEP20;
 
 int main() {
-  TReport const report = MakeReport(LoadPlugIns());
+  TReport const report = MakeReport(LoadPlugInsApart());
   for (TReportRow const& row : report.fIdentity) {
     bool const isKnown = row.fAnswer.IsKnown();
     std::string const text = isKnown ? std::get<std::string>(*row.fAnswer.fValue) : "? " + row.fAnswer.fMissing.fReason;

@@ -147,12 +147,13 @@ public:
 };
 
 template <class TClass>
-boost::shared_ptr<TMemoryNamespace> NamespaceWith() {
+boost::shared_ptr<TMemoryNamespace> NamespaceWith(std::size_t textLength) {
   auto const ns = boost::make_shared<TOwnNamespace>("root/own");
   auto const cls = boost::make_shared<TClass>(ns, nullptr, "X_Own");
   ns->fClass = cls;
   cls->AddPropertyDecl("Id", TCIMValue(TCIMValue::TCIMType::kCIMTypeUint32, 0), TCIMContext());
-  cls->AddInstance({{"Id", 1}});
+  cls->AddPropertyDecl("Text", TCIMValue(TCIMValue::TCIMType::kCIMTypeString, 0), TCIMContext());
+  cls->AddInstance({{"Id", 1}, {"Text", std::string(textLength, 'x')}});
   return ns;
 }
 
@@ -226,8 +227,8 @@ public:
     return TMemoryProvider::GetName(context);
   }
   boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) override {
-    if (OwnName() == "AnswersForever") return NamespaceWith<TEndlessClass>();
-    if (OwnName() == "AnswersBroken") return NamespaceWith<TBrokenClass>();
+    if (OwnName() == "AnswersForever") return NamespaceWith<TEndlessClass>(1024 * 1024);
+    if (OwnName() == "AnswersBroken") return NamespaceWith<TBrokenClass>(0);
     return TMemoryProvider::GetNamespace(context);
   }
 };

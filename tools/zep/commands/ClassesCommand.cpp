@@ -28,6 +28,7 @@ struct TArguments {
   bool fAsJson = false;
   bool fSample = false;
   std::string fMofFile;
+  TPlugInArguments fPlugIns;
 };
 
 struct TNamespaceClasses {
@@ -115,7 +116,7 @@ TClasses FindClasses(TArguments const& arguments) {
   TClasses classes;
   bool const isMof = !arguments.fMofFile.empty();
   auto const sample = SampleIf(arguments.fSample);
-  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugInsQuietly(sample);
+  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugInsFor(arguments.fPlugIns, sample);
   classes.fSampleLabel = sample ? sample->fLabel : "";
   classes.fFailures = FailuresOf(plugIns);
   for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
@@ -143,6 +144,7 @@ TRun AddClassesArguments(CLI::App& command) {
       command.add_option("--mof", arguments->fMofFile, "List the classes of this MOF file instead of the providers'");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.add_flag("--sample", arguments->fSample, "List the classes for the bundled sample, labelled SAMPLE")->excludes(mof);
+  AddPlugInOptions(command, arguments->fPlugIns);
   command.footer(
       "Exit status: 0 when there are classes, 2 when there are classes but a plug-in failed, 1 when there are none,\n"
       "64 for wrong usage.");

@@ -1,9 +1,16 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/commands/Providers.h"
 
+#include "collect/PlugInsApart.h"
 #include "tools/zep/output/Output.h"
+#include "tools/zep/output/TPlugInProgress.h"
+#include "tools/zep/output/Text.h"
+
+#include <CLI/CLI.hpp>
 
 #include <filesystem>
+#include <iostream>
+#include <sstream>
 #include <stdexcept>
 
 namespace NQRVZEP20::zep {
@@ -13,6 +20,12 @@ namespace {
 namespace fs = std::filesystem;
 
 constexpr char const* kSampleFromBinDir = "../share/zepcore/sample/smbios.bin";  // in a build tree and installed
+
+void WriteWords(TPlugIn const& plugIn) {
+  std::istringstream words(plugIn.fWords);
+  for (std::string line; std::getline(words, line);)
+    std::cerr << "zep: plug-in " << Printable(plugIn.fName) << " printed: " << Printable(line) << "\n";
+}
 
 }  // namespace
 
@@ -24,9 +37,36 @@ TSample BundledSample() {
 
 std::optional<TSample> SampleIf(bool isWanted) { return isWanted ? std::optional(BundledSample()) : std::nullopt; }
 
-std::vector<TPlugIn> LoadPlugInsQuietly(std::optional<TSample> const& sample) {
-  TOutputGuard const guard;
-  return LoadPlugIns(sample);
+void AddPlugInOptions(CLI::App& command, TPlugInArguments& arguments) {
+  auto* const timeout =
+      command
+          .add_option("--plugin-timeout", arguments.fTimeoutSeconds,
+                      "The time in seconds that a plug-in may take to load, and again to fill its namespaces (60)")
+          ->check(CLI::Range(1, 86400));
+  auto* const memory = command
+                           .add_option("--plugin-memory", arguments.fMemoryMebibytes,
+                                       "The memory in MiB that the process of a plug-in may use in addition to that of zep")
+                           ->check(CLI::Range(1, 1048576));
+  command
+      .add_flag("--in-process", arguments.fInProcess,
+                "Load the plug-ins into zep itself, for a debugger: one that crashes or hangs then does so to zep")
+      ->excludes(timeout)
+      ->excludes(memory);
+}
+
+std::vector<TPlugIn> LoadPlugInsFor(TPlugInArguments const& arguments, std::optional<TSample> const& sample) {
+  if (arguments.fInProcess) {
+    TOutputGuard const guard;
+    return LoadPlugIns(sample);
+  }
+  TPlugInProgress progress;
+  TApartOptions options;
+  options.fLimits.fTimeoutSeconds = arguments.fTimeoutSeconds;
+  options.fLimits.fMemoryMebibytes = arguments.fMemoryMebibytes;
+  options.fShowProgress = [&progress](std::vector<TPlugInAtWork> const& atWork) { progress.Show(atWork); };
+  std::vector<TPlugIn> plugIns = LoadPlugInsApart(sample, options);
+  for (TPlugIn const& plugIn : plugIns) WriteWords(plugIn);
+  return plugIns;
 }
 
 }  // namespace NQRVZEP20::zep

@@ -34,6 +34,7 @@ struct TArguments {
   bool fBySftp = false;
   std::string fTarget;  // empty: nowhere
   TTransferOptions fOptions;
+  TPlugInArguments fPlugIns;
   std::string fMedium;  // the device to write to; empty for standard output
 };
 
@@ -121,7 +122,7 @@ int Report(TArguments const& arguments) {
     TTarget const target = arguments.fTarget.empty() ? TTarget{} : TargetOf(arguments.fTarget, arguments.fBySftp);
     if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
     sample = SampleIf(arguments.fSample);
-    return Deliver(MakeReport(LoadPlugInsQuietly(sample), sample), target, arguments, guard);
+    return Deliver(MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample), target, arguments, guard);
   } catch (std::exception const& failure) {
     bool const isOfMedium = !arguments.fMedium.empty() && arguments.fAsJson && !HasWrittenOutput();
     if (isOfMedium) WriteOutput(FailureAsJson(kToMedia, StatusOf(failure), failure.what(), sample ? sample->fLabel : ""));
@@ -145,6 +146,7 @@ TRun AddReportArguments(CLI::App& command) {
                      "[USER@]HOST[:PORT] alone. A report that cannot be sent is kept in a file, whose path is printed");
   command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
   AddUploadOptions(command, arguments->fOptions);
+  AddPlugInOptions(command, arguments->fPlugIns);
   command.footer(
       "Exit status: 0 when the identity is complete (the details do not count), 2 when a part of it is missing or a\n"
       "plug-in failed, 1 when no part of it is known or the medium could not be written and unmounted, 64 for wrong\n"

@@ -39,6 +39,7 @@ struct TArguments {
   bool fAsJson = false;
   bool fSample = false;
   std::string fMofFile;
+  TPlugInArguments fPlugIns;
 };
 
 // The namespace that a path names before its class; empty when it names none.
@@ -272,7 +273,7 @@ struct TSearch {
 TSearch Search(TArguments const& arguments, std::optional<TSample> const& sample) {
   TSearch search;
   bool const isMof = !arguments.fMofFile.empty();
-  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugInsQuietly(sample);
+  std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugInsFor(arguments.fPlugIns, sample);
   search.fFailures = FailuresOf(plugIns);
   for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
     std::string const failure = FailureOf([&] {
@@ -311,6 +312,7 @@ TRun AddShowArguments(CLI::App& command) {
   auto* const mof = command.add_option("--mof", arguments->fMofFile, "Search this MOF file instead of the providers");
   command.add_flag("--sample", arguments->fSample, "Show objects of the bundled sample, an invented server, labelled SAMPLE")
       ->excludes(mof);
+  AddPlugInOptions(command, arguments->fPlugIns);
   command.footer("Exit status: 0 when there is such an object, 1 when there is none, 64 for wrong usage.");
   return [arguments] { return Show(*arguments); };
 }

@@ -54,7 +54,7 @@ TJson PropertyAsJson(TNamespaceView const& view, ICIMInstance const& instance, I
 
 // Whether the member contains a message or repeats an argument. All others contain data, which is printed unchanged.
 bool IsMessage(std::string const& key) {
-  constexpr char const* kMessages[] = {"reason", "error", "failure", "host", "url", "proxy", "command"};
+  constexpr char const* kMessages[] = {"reason", "error", "failure", "lastLogLine", "words", "host", "url", "proxy", "command"};
   return std::find(std::begin(kMessages), std::end(kMessages), key) != std::end(kMessages);
 }
 

@@ -30,11 +30,16 @@ TJson PlugInsAsJson(std::vector<TPlugIn> const& plugIns) {
       providers.push_back({{"name", provider.fName},
                            {"namespace", provider.fView ? TJson(provider.fView->GetName()) : TJson(nullptr)},
                            {"milliseconds", provider.fMilliseconds},
-                           {"error", OrNull(provider.fError)}});
+                           {"error", OrNull(provider.fError)},
+                           {"stage", OrNull(provider.fStage)},
+                           {"lastLogLine", OrNull(provider.fLastLogLine)}});
     json.push_back({{"name", plugIn.fName},
                     {"file", plugIn.fFile},
                     {"milliseconds", plugIn.fMilliseconds},
                     {"error", OrNull(plugIn.fError)},
+                    {"stage", OrNull(plugIn.fStage)},
+                    {"lastLogLine", OrNull(plugIn.fLastLogLine)},
+                    {"words", OrNull(plugIn.fWords)},
                     {"providers", providers}});
   }
   return json;

@@ -33,13 +33,14 @@ std::string AsMilliseconds(double milliseconds) {
 }
 
 std::string ResultOf(TPlugIn const& plugIn) {
-  if (!plugIn.fError.empty()) return "failed: " + MessageWithoutSecrets(plugIn.fError);
+  if (!plugIn.fError.empty()) return "failed: " + MessageWithoutSecrets(FailurePhraseOf(plugIn));
   if (plugIn.fProviders.empty()) return "loaded, but registered no provider of its own";
   std::string text;
   for (TProviderRun const& provider : plugIn.fProviders) {
     if (!text.empty()) text += "; ";
-    text += provider.fError.empty() ? "filled " + provider.fView->GetName()
-                                    : "provider " + provider.fName + " failed: " + MessageWithoutSecrets(provider.fError);
+    text += provider.fError.empty()
+                ? "filled " + provider.fView->GetName()
+                : "provider " + provider.fName + " failed: " + MessageWithoutSecrets(FailurePhraseOf(plugIn, provider));
   }
   return text;
 }

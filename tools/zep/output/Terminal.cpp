@@ -22,6 +22,11 @@ std::string Variable(char const* name) {
 
 bool IsDumb() { return Variable("TERM") == "dumb"; }
 
+ELayout LayoutOf(int fd) {
+  if (::isatty(fd) == 0) return ELayout::kFile;
+  return IsDumb() ? ELayout::kPlain : ELayout::kTerminal;
+}
+
 std::size_t WidthOfTerminal() {
   if (std::size_t const columns = ColumnsFrom(Variable("COLUMNS"))) return columns;
   winsize size{};
@@ -31,10 +36,9 @@ std::size_t WidthOfTerminal() {
 
 }  // namespace
 
-ELayout OutputLayout() {
-  if (::isatty(STDOUT_FILENO) == 0) return ELayout::kFile;
-  return IsDumb() ? ELayout::kPlain : ELayout::kTerminal;
-}
+ELayout OutputLayout() { return LayoutOf(STDOUT_FILENO); }
+
+ELayout ErrorsLayout() { return LayoutOf(STDERR_FILENO); }
 
 std::size_t OutputWidth() {
   switch (OutputLayout()) {
@@ -47,7 +51,7 @@ std::size_t OutputWidth() {
   }
 }
 
-bool CanRedrawErrors() { return ::isatty(STDERR_FILENO) != 0 && !IsDumb(); }
+bool CanRedrawErrors() { return ErrorsLayout() == ELayout::kTerminal; }
 
 std::size_t ColumnsFrom(std::string_view text) {
   std::size_t columns = 0;

@@ -8,12 +8,13 @@ namespace NQRVZEP20::zep {
 
 // The layout of text for people.
 enum class ELayout {
-  kFile,      // standard output is not a terminal: columns have their fixed widths
+  kFile,      // it does not go to a terminal: columns have their fixed widths
   kTerminal,  // lines as wide as the terminal
   kPlain      // TERM is "dumb": a row of a table is one line, however long
 };
 
-ELayout OutputLayout();
+ELayout OutputLayout();  // of standard output
+ELayout ErrorsLayout();  // of standard error
 
 // The width of a line on standard output, in columns: that of the terminal, from COLUMNS or the system, otherwise 80. With kPlain
 // there is no limit.

@@ -278,8 +278,8 @@ TEST_F(MofTest, AProviderWhoseSchemaIsWrongIsReportedWithThePlace) {
   TRun const run = Run({"classes"});
   EXPECT_EQ(run.status, 2);
   EXPECT_THAT(run.errors, testing::StartsWith("zep: Disks: "));
-  EXPECT_THAT(run.errors,
-              testing::EndsWith("/disks.mof:1:15: expected a type, a class and \"REF\", or \"}\", found the end of the file\n"));
+  EXPECT_THAT(run.errors, testing::EndsWith("/disks.mof:1:15: expected a type, a class and \"REF\", or \"}\", found the end of "
+                                            "the file (fill, libDisks.nsp.so)\n"));
 }
 
 // ---- The real schema ----

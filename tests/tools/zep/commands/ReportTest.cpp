@@ -514,7 +514,8 @@ TEST_F(ReportTest, ABrokenPlugInIsReportedWithTheLinkersReasonAndStopsNoOther) {
   ASSERT_EQ(rows.size(), 2u);
   EXPECT_EQ(rows[0][0], "Broken");
   EXPECT_THAT(rows[0][1], testing::MatchesRegex("[0-9]+\\.[0-9] ms"));
-  EXPECT_EQ(WithoutBlanks(rows[0][2]), WithoutBlanks("failed: " + fZep.Path("bin/../lib/libBroken.nsp.so") + ": file too short"));
+  EXPECT_EQ(WithoutBlanks(rows[0][2]),
+            WithoutBlanks("failed: " + fZep.Path("bin/../lib/libBroken.nsp.so") + ": file too short (open, libBroken.nsp.so)"));
   EXPECT_EQ(rows[1][0], "Host");
   EXPECT_EQ(rows[1][2], "filled root/zep/host");
 
@@ -539,7 +540,7 @@ TEST_F(ReportTest, AProviderThatFailsIsReportedAndStopsNoOther) {
       {"throws", "provider Test failed: kZEPStatusAccessDenied"},
       {"throws-a-number", "provider Test failed: it threw something that is not a std::exception"},
       {"no-namespace", "provider Test failed: it has no namespace"},
-      {"fails-at-once", "provider Test failed: kZEPStatusFail"},
+      {"fails-at-once", "provider Test failed: it threw something that is not a std::exception"},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.fBehaviour);
@@ -549,11 +550,13 @@ TEST_F(ReportTest, AProviderThatFailsIsReportedAndStopsNoOther) {
     auto const plugIns = PlugInRowsOf(run.output);
     ASSERT_EQ(plugIns.size(), 2u);
     EXPECT_EQ(plugIns[1][0], "Test");
-    EXPECT_EQ(plugIns[1][2], row.fResult);
+    EXPECT_EQ(WithoutBlanks(plugIns[1][2]), WithoutBlanks(std::string(row.fResult) + " (fill, libTest.nsp.so)"));
     auto const provider = JsonOf(RunWithTestProvider(row.fBehaviour, {"--json"}))["plugIns"][1]["providers"][0];
     EXPECT_EQ("provider Test failed: " + provider["error"].get<std::string>(), row.fResult);
     EXPECT_TRUE(provider["namespace"].is_null());
   }
+  EXPECT_EQ(JsonOf(RunWithTestProvider("fails-at-once", {"--json", "--in-process"}))["plugIns"][1]["providers"][0]["error"],
+            "kZEPStatusFail");
 }
 
 TEST_F(ReportTest, TheReasonOfAFailureIsReported) {
@@ -562,34 +565,55 @@ TEST_F(ReportTest, TheReasonOfAFailureIsReported) {
   std::string const error = JsonOf(run)["plugIns"][1]["providers"][0]["error"];
   EXPECT_EQ(error, "kZEPStatusTypeMismatch (X_Refused.Kind refused: kZEPStatusTypeMismatch)");
   EXPECT_EQ(WithoutBlanks(PlugInRowsOf(RunWithTestProvider("is-refused").output)[1][2]),
-            WithoutBlanks("provider Test failed: " + error));
+            WithoutBlanks("provider Test failed: " + error +
+                          " (fill, libTest.nsp.so); last log line: [Error] X_Refused.Kind refused: kZEPStatusTypeMismatch"));
 }
 
 TEST_F(ReportTest, ANamespaceThatFailsLaterIsReportedWhereItFails) {
   fZep.Remove("libHost.nsp.so");
-  TRun const run = RunWithTestProvider("fails-later");
+  TRun const run = RunWithTestProvider("fails-later", {"--in-process"});
   EXPECT_EQ(run.status, 1);
   EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: provider Test failed: kZEPStatusFail");
 
-  auto const document = JsonOf(RunWithTestProvider("fails-later", {"--json"}));
+  auto const document = JsonOf(RunWithTestProvider("fails-later", {"--json", "--in-process"}));
   EXPECT_THAT(document["instances"], IsEmpty());
   EXPECT_EQ(document["instanceFailures"][0]["provider"], "Test");
   EXPECT_EQ(document["instanceFailures"][0]["error"], "it threw something that is not a std::exception");
 }
 
+TEST_F(ReportTest, ANamespaceWhoseClassesCannotBeReadIsReported) {
+  fZep.Remove("libHost.nsp.so");
+  TRun const run = RunWithTestProvider("fails-later", {"--json"});
+  EXPECT_EQ(run.status, 1);
+  auto const provider = JsonOf(run)["plugIns"][0]["providers"][0];
+  EXPECT_EQ(provider["error"], "it threw something that is not a std::exception");
+  EXPECT_EQ(provider["stage"], "fill");
+}
+
 TEST_F(ReportTest, APlugInThatRegistersNothingIsReported) {
-  for (char const* behaviour : {"is-silent", "calls-itself-host"}) {
-    TRun const run = RunWithTestProvider(behaviour);
-    EXPECT_EQ(run.status, 0) << behaviour;
-    EXPECT_EQ(PlugInRowsOf(run.output)[1][2], "loaded, but registered no provider of its own") << behaviour;
-  }
+  TRun const run = RunWithTestProvider("is-silent");
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(PlugInRowsOf(run.output)[1][2], "loaded, but registered no provider of its own");
+}
+
+TEST_F(ReportTest, TwoPlugInsThatRegisterOneNameAreBothNamed) {
+  TRun const run = RunWithTestProvider("calls-itself-host");
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(PlugInRowsOf(run.output)[0][2], "filled root/zep/host");
+  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(run.output)[1][2]),
+            WithoutBlanks("provider Host failed: the name Host is registered by libHost.nsp.so, which comes first (registration, "
+                          "libTest.nsp.so)"));
 }
 
 TEST_F(ReportTest, OutputOfPlugInsStaysOutOfTheDocument) {
   TRun const run = RunWithTestProvider("prints", {"--json"});
   EXPECT_EQ(JsonOf(run)["plugIns"].size(), 2u);
   EXPECT_THAT(run.output, StartsWith("{"));
-  EXPECT_THAT(run.errors, AllOf(HasSubstr("noise while loading"), HasSubstr("noise while filling")));
+  EXPECT_EQ(run.errors, "zep: plug-in Test printed: noise while loading\nzep: plug-in Test printed: noise while filling\n");
+  EXPECT_EQ(JsonOf(run)["plugIns"][1]["words"], "noise while loading\nnoise while filling\n");
+  TRun const inProcess = RunWithTestProvider("prints", {"--json", "--in-process"});
+  EXPECT_THAT(inProcess.output, StartsWith("{"));
+  EXPECT_THAT(inProcess.errors, AllOf(HasSubstr("noise while loading"), HasSubstr("noise while filling")));
 }
 
 TEST_F(ReportTest, TheFirstProviderThatKnowsAValueGivesIt) {

@@ -181,11 +181,14 @@ TEST_F(ShowTest, AnObjectWhoseKeysAreReferencesIsFoundByItsPrintedPath) {
 
 TEST_F(ShowTest, AProviderThatFailedIsNamed) {
   std::string const nothing = "zep: no provider has the object \"X_Odd\"\n";
-  EXPECT_EQ(Run({"show", "X_Odd"}, "throws").errors, "zep: Test: kZEPStatusAccessDenied\n" + nothing);
-  EXPECT_EQ(Run({"show", "X_Odd"}, "fails-later").errors, "zep: Test: kZEPStatusFail\n" + nothing);
+  EXPECT_EQ(Run({"show", "X_Odd"}, "throws").errors, "zep: Test: kZEPStatusAccessDenied (fill, libTest.nsp.so)\n" + nothing);
+  EXPECT_EQ(Run({"show", "X_Odd"}, "fails-later").errors,
+            "zep: Test: it threw something that is not a std::exception (fill, libTest.nsp.so)\n" + nothing);
+  EXPECT_EQ(Run({"show", "X_Odd", "--in-process"}, "fails-later").errors, "zep: Test: kZEPStatusFail\n" + nothing);
   WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
-  EXPECT_EQ(Run({"show", "X_None"}).errors, "zep: Broken: " + fZep.Path("bin/../lib/libBroken.nsp.so") +
-                                                ": file too short\nzep: no provider has the object \"X_None\"\n");
+  EXPECT_EQ(Run({"show", "X_None"}).errors,
+            "zep: Broken: " + fZep.Path("bin/../lib/libBroken.nsp.so") +
+                ": file too short (open, libBroken.nsp.so)\nzep: no provider has the object \"X_None\"\n");
   TRun const run = Run({"show", "X_Odd"});
   EXPECT_EQ(run.status, 0);
   EXPECT_EQ(run.errors, "");
@@ -194,8 +197,12 @@ TEST_F(ShowTest, AProviderThatFailedIsNamed) {
 TEST_F(ShowTest, ClassesNamesANamespaceThatFailsAndShowsTheOthers) {
   TRun const run = Run({"classes", "--json"}, "fails-later");
   EXPECT_EQ(run.status, 2);
-  EXPECT_EQ(run.errors, "zep: Test: it threw something that is not a std::exception\n");
+  EXPECT_EQ(run.errors, "zep: Test: it threw something that is not a std::exception (fill, libTest.nsp.so)\n");
   EXPECT_EQ(JsonOf(run)["namespaces"].size(), 1u);
+  TRun const inProcess = Run({"classes", "--json", "--in-process"}, "fails-later");
+  EXPECT_EQ(inProcess.status, 2);
+  EXPECT_EQ(inProcess.errors, "zep: Test: it threw something that is not a std::exception\n");
+  EXPECT_EQ(JsonOf(inProcess)["namespaces"].size(), 1u);
 }
 
 TEST_F(ShowTest, AMissingObjectHasADocument) {

@@ -58,7 +58,8 @@ TEST(ReportPhrasesTest, TheHeadNamesTheMachineAndItsOperatingSystem) {
 
 TEST(ReportPhrasesTest, AdjacentRowsShareTheirReason) {
   TReport report = Report();
-  EXPECT_EQ(WhyNotComplete(report), "Model, Serial number: needs root; OS version: no version; Broken: file too short");
+  EXPECT_EQ(WhyNotComplete(report),
+            "Model, Serial number: needs root; OS version: no version; Broken: file too short (libBroken.nsp.so)");
   report.fCompleteness = ECompleteness::kComplete;
   EXPECT_EQ(WhyNotComplete(report), "");
 }

@@ -1,0 +1,222 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/zep/commands/Providers.h"
+
+#include "tests/Support.h"
+#include "tests/tools/zep/Zep.h"
+
+#include <gmock/gmock.h>
+#include <pty.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <csignal>
+#include <regex>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+using testing::AllOf;
+using testing::Contains;
+using testing::HasSubstr;
+
+// Times differ.
+std::string WithoutTimes(std::string const& text) {
+  std::string const json = std::regex_replace(text, std::regex("\"milliseconds\": [0-9.e+-]+"), "\"milliseconds\": N");
+  return std::regex_replace(json, std::regex(" *[0-9]+\\.[0-9] ms"), " N ms");
+}
+
+class ProvidersTest : public testing::Test {
+protected:
+  void Add(std::vector<std::string> const& misdeeds) {
+    for (std::string const& name : misdeeds) fZep.Add("lib" + name + ".nsp.so", MISBEHAVES);
+  }
+
+  TRun Run(std::vector<std::string> const& arguments) const {
+    TCall call;
+    call.arguments = arguments;
+    call.environment = Environment();
+    return fZep.Run(call);
+  }
+
+  std::map<std::string, std::string> Environment() const {
+    return {{"ZEP_SMBIOS_TABLE", SamplePath()},
+            {"ZEP_HOST_NAME", "db1"},
+            {"ZEP_MISDEEDS", fZep.Path("")},
+            {"ZEP_TEST_PROVIDER", "odd hard-to-name two-systems"}};
+  }
+
+  // The plug-in, or its first provider when that failed.
+  static nlohmann::json FailureIn(nlohmann::json const& document, std::string const& name) {
+    for (auto const& plugIn : document["plugIns"])
+      if (plugIn["name"] == name)
+        return plugIn["error"].is_null() && !plugIn["providers"].empty() ? plugIn["providers"][0] : plugIn;
+    return {};
+  }
+
+  void WaitFor(std::string const& file) const {
+    for (int tries = 0; ReadFile(fZep.Path(file)).empty() && tries < 6000; ++tries) ::usleep(10000);
+    ASSERT_FALSE(ReadFile(fZep.Path(file)).empty());
+  }
+
+  void ExpectNoProcess(std::string const& file) const {
+    std::string const id = ReadFile(fZep.Path(file));
+    ASSERT_FALSE(id.empty()) << file;
+    for (int tries = 0; fs::exists("/proc/" + id) && tries < 6000; ++tries) ::usleep(10000);
+    EXPECT_FALSE(fs::exists("/proc/" + id)) << file;
+  }
+
+  TInstallation fZep;
+};
+
+// ---- Plug-ins that behave ----
+
+TEST_F(ProvidersTest, TheOutputIsThatOfPlugInsInTheProcessOfZep) {
+  fZep.Add("libTest.nsp.so", TEST_PROVIDER);
+  fZep.Add("libClock.nsp.so", CLOCK_PLUGIN);
+  fZep.Add("libDisks.nsp.so", DISKS_PLUGIN);
+  for (std::vector<std::string> arguments : std::vector<std::vector<std::string>>{{"report"},
+                                                                                  {"report", "--json"},
+                                                                                  {"report", "--sample", "--json"},
+                                                                                  {"classes"},
+                                                                                  {"classes", "--json"},
+                                                                                  {"show", "X_Odd"},
+                                                                                  {"show", "X_Odd", "--json"},
+                                                                                  {"show", "CIM_Processor"},
+                                                                                  {"show", "X_Plain#1"}}) {
+    SCOPED_TRACE(arguments.back());
+    TRun const apart = Run(arguments);
+    arguments.push_back("--in-process");
+    TRun const inProcess = Run(arguments);
+    EXPECT_EQ(WithoutTimes(apart.output), WithoutTimes(inProcess.output));
+    EXPECT_FALSE(apart.output.empty());
+    EXPECT_EQ(apart.status, inProcess.status);
+  }
+}
+
+// ---- Plug-ins that misbehave ----
+
+TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
+  struct TRow {
+    char const *fName, *fStage, *fError, *fLastLogLine;
+  } const rows[] = {
+      {"Throws", "fill", "kZEPStatusAccessDenied (no disk)", "[Error] the disk is gone"},
+      {"ThrowsInAThread", "fill", "in a thread", nullptr},
+      {"Crashes", "fill", "it was ended by SIGSEGV (Segmentation fault)", "[Error] about to crash"},
+      {"Aborts", "fill", "it was ended by SIGABRT (Aborted)", nullptr},
+      {"Exits", "fill", "it ended the process with status 0", nullptr},
+      {"ExitsAtOnce", "fill", "it ended the process with status 7", nullptr},
+      {"Executes", "fill", "it ended the process with status 9", nullptr},
+      {"Closes", "fill", "it closed the descriptor of its answer", nullptr},
+      {"LoadThrows", "static construction", "no disk today", nullptr},
+      {"LoadCrashes", "static construction", "it was ended by SIGSEGV (Segmentation fault)", nullptr},
+      {"LoadExits", "static construction", "it ended the process with status 3", nullptr},
+      {"RegistrationThrows", "registration", "it has no name", nullptr},
+  };
+  for (TRow const& row : rows) Add({row.fName});
+  Add({"ChangesDirectory", "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken"});
+  TRun const run = Run({"report", "--json"});
+  EXPECT_EQ(run.status, 2);
+  auto const document = JsonOf(run);
+  EXPECT_EQ(document["identity"]["serialNumber"]["value"], "KQ12345");
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.fName);
+    auto const failure = FailureIn(document, row.fName);
+    EXPECT_EQ(failure["error"], row.fError);
+    EXPECT_EQ(failure["stage"], row.fStage);
+    EXPECT_EQ(failure["lastLogLine"], row.fLastLogLine != nullptr ? nlohmann::json(row.fLastLogLine) : nlohmann::json());
+    EXPECT_THAT(document["reason"].get<std::string>(), HasSubstr("lib" + std::string(row.fName) + ".nsp.so"));
+  }
+  for (char const* name : {"ChangesDirectory", "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken"})
+    EXPECT_TRUE(FailureIn(document, name)["error"].is_null()) << name;
+  ExpectNoProcess("Forks");
+}
+
+TEST_F(ProvidersTest, TheRowOfAFailureNamesFileProviderStageCauseAndLogLine) {
+  Add({"Crashes"});
+  TRun const run = Run({"report"});
+  EXPECT_EQ(run.status, 2);
+  std::string const words = std::regex_replace(run.output, std::regex("\\s+"), " ");
+  EXPECT_THAT(words, HasSubstr("provider Crashes failed: it was ended by SIGSEGV (Segmentation fault) (fill, "
+                               "libCrashes.nsp.so); last log line: [Error] about to crash"));
+  EXPECT_EQ(Run({"classes"}).status, 2);
+  EXPECT_EQ(Run({"classes"}).errors,
+            "zep: Crashes: it was ended by SIGSEGV (Segmentation fault) (fill, libCrashes.nsp.so); last "
+            "log line: [Error] about to crash\n");
+  EXPECT_EQ(Run({"show", "CIM_Chassis"}).status, 0);
+}
+
+TEST_F(ProvidersTest, PlugInsThatHangOrStopAreEndedAtTheTimeLimit) {
+  fZep.Remove("libHost.nsp.so");
+  Add({"Hangs", "HangsBlocked", "Stops", "LoadHangs"});
+  auto const document = JsonOf(Run({"report", "--json", "--plugin-timeout", "2"}));
+  for (char const* name : {"Hangs", "HangsBlocked", "Stops", "LoadHangs"})
+    EXPECT_EQ(FailureIn(document, name)["error"], "it exceeded the time limit of 2 s") << name;
+  EXPECT_EQ(FailureIn(document, "LoadHangs")["stage"], "static construction");
+  ExpectNoProcess("Hangs");
+  ExpectNoProcess("HangsBlocked");
+}
+
+TEST_F(ProvidersTest, APlugInThatFillsMemoryIsEndedAtTheMemoryLimit) {
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer reserves more address space than any limit";
+  Add({"FillsMemory"});
+  TRun const run = Run({"report", "--json", "--plugin-memory", "64"});
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(FailureIn(JsonOf(run), "FillsMemory")["error"], "std::bad_alloc (the memory limit is 64 MiB)");
+}
+
+TEST_F(ProvidersTest, AnEndlessAnswerIsCutOff) {
+  Add({"AnswersForever"});
+  TRun const run = Run({"report", "--json"});
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(FailureIn(JsonOf(run), "AnswersForever")["error"], "its answer exceeds 268435456 bytes");
+}
+
+// ---- Interrupts and the terminal ----
+
+TEST_F(ProvidersTest, AnInterruptLeavesNoProcess) {
+  Add({"Hangs"});
+  pid_t const zep = ::fork();
+  if (zep == 0) {
+    for (auto const& [name, value] : Environment()) ::setenv(name.c_str(), value.c_str(), 1);
+    ::execl(fZep.Path("bin/zep").c_str(), "zep", "report", nullptr);
+    ::_exit(127);
+  }
+  WaitFor("Hangs");
+  ::kill(zep, SIGINT);
+  int status = 0;
+  ::waitpid(zep, &status, 0);
+  EXPECT_TRUE(WIFSIGNALED(status) && WTERMSIG(status) == SIGINT);
+  ExpectNoProcess("Hangs");
+}
+
+// What zep writes to a terminal.
+std::string OnTerminal(std::string const& program, std::map<std::string, std::string> const& environment) {
+  int terminal = -1;
+  pid_t const zep = ::forkpty(&terminal, nullptr, nullptr, nullptr);
+  if (zep == 0) {
+    for (auto const& [name, value] : environment) ::setenv(name.c_str(), value.c_str(), 1);
+    ::execl(program.c_str(), "zep", "classes", "--plugin-timeout", "2", nullptr);
+    ::_exit(127);
+  }
+  std::string text;
+  char piece[1024];
+  for (ssize_t count; (count = ::read(terminal, piece, sizeof piece)) > 0;) text.append(piece, static_cast<std::size_t>(count));
+  ::close(terminal);
+  ::waitpid(zep, nullptr, 0);
+  return text;
+}
+
+TEST_F(ProvidersTest, ProgressIsShownOnATerminalOnly) {
+  Add({"LoadHangs"});
+  auto environment = Environment();
+  environment["TERM"] = "xterm";
+  EXPECT_THAT(OnTerminal(fZep.Path("bin/zep"), environment), HasSubstr("\r\x1b[KLoadHangs: static construction, "));
+  environment["TERM"] = "dumb";
+  std::string const dumb = OnTerminal(fZep.Path("bin/zep"), environment);
+  EXPECT_THAT(dumb, HasSubstr("LoadHangs: static construction, "));
+  EXPECT_EQ(dumb.find('\x1b'), dumb.npos);
+  EXPECT_THAT(Run({"classes", "--plugin-timeout", "2"}).errors, testing::Not(HasSubstr("LoadHangs: static construction")));
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep
