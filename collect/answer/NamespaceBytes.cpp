@@ -90,6 +90,8 @@ public:
   std::optional<std::size_t> const& SuperOf(std::size_t cls) const { return fSupers[cls]; }
 
   std::optional<std::size_t> NumberOf(ICIMClass const& cls) const {
+    auto const known = fNumbersOfObjects.find(&cls);
+    if (known != fNumbersOfObjects.end()) return known->second;
     auto const found = fNumbers.find(FoldName(cls.GetName(kNone)));
     return found == fNumbers.end() ? std::nullopt : std::optional(found->second);
   }
@@ -120,6 +122,7 @@ private:
           return true;
         },
         kNone);
+    fNumbersOfObjects.emplace(cls.get(), number);
     fClasses.push_back(cls);
     fSupers.push_back(super);
     fDecls.push_back(std::move(decls));
@@ -130,6 +133,7 @@ private:
   std::vector<std::optional<std::size_t>> fSupers;
   std::vector<std::vector<TDeclPtr>> fDecls;  // by class
   TClassNumbers fNumbers;
+  std::unordered_map<ICIMClass const*, std::size_t> fNumbersOfObjects;
   std::unordered_map<ICIMPropertyDecl const*, TDeclNumber> fDeclNumbers;
   std::optional<TRecordedFailure> fFailure;  // that ended the enumeration of the classes
 };
@@ -317,8 +321,51 @@ private:
     WriteEnding(fWriter, failure);
   }
 
-  // A record is complete before it is added.
+  // A record is complete before it is added. Nearly every instance has the layout of the one before it.
   void WriteInstance(ICIMInstance const& instance, std::size_t root) {
+    std::size_t cls = root;
+    auto const classFailure = FailureOfEnumeration([&] { cls = fSchema.NumberOf(*instance.GetClass(kNone)).value_or(root); });
+    if (classFailure) cls = ClassOfPath(instance).value_or(root);
+    bool const isKnown = !classFailure && !fLayoutsOf[cls].empty();
+    std::size_t layout = isKnown ? fLayoutsOf[cls].back() : 0;
+    if (!isKnown || !WriteValuesOfLayout(instance, layout)) {
+      ReadProperties(instance);
+      layout = LayoutFor(cls, classFailure);
+      BeginRecord(layout);
+      for (auto const& property : fProperties) AddValue(*property);
+      fProperties.clear();
+    }
+    fStarts.push_back(fRecord.Bytes().size());
+    WritePath(instance, cls, fLayouts[layout]);
+    fWriter.Raw(fRecord.Bytes());
+    if (fWriter.Bytes().size() >= kPieceBytes) Send();
+  }
+
+  void BeginRecord(std::size_t layout) {
+    fStarts.clear();
+    fRecord.Clear();
+    fRecord.Byte(kInstance);
+    fRecord.Number(layout);
+  }
+
+  // False when the instance turns out to have other properties.
+  bool WriteValuesOfLayout(ICIMInstance const& instance, std::size_t number) {
+    TLayout const& layout = fLayouts[number];
+    std::size_t count = 0;
+    bool fits = true;
+    BeginRecord(number);
+    instance.EnumerateProperties(
+        [&](boost::shared_ptr<ICIMProperty> const& property) {
+          TDeclPtr const decl = DeclarationOf(*property);
+          fits = count < layout.fDecls.size() && decl && decl == layout.fDecls[count++];
+          if (fits) AddValue(*property);
+          return fits;
+        },
+        kNone);
+    return fits && count == layout.fDecls.size();
+  }
+
+  void ReadProperties(ICIMInstance const& instance) {
     fProperties.clear();
     instance.EnumerateProperties(
         [&](boost::shared_ptr<ICIMProperty> const& property) {
@@ -326,18 +373,6 @@ private:
           return true;
         },
         kNone);
-    std::size_t cls = root;
-    auto const classFailure = FailureOfEnumeration([&] { cls = fSchema.NumberOf(*instance.GetClass(kNone)).value_or(root); });
-    if (classFailure) cls = ClassOfPath(instance).value_or(root);
-    std::size_t const layout = LayoutFor(cls, classFailure);
-
-    fRecord.Clear();
-    fRecord.Byte(kInstance);
-    fRecord.Number(layout);
-    WriteValues();
-    WritePath(instance, cls, fLayouts[layout]);
-    fWriter.Raw(fRecord.Bytes());
-    if (fWriter.Bytes().size() >= kPieceBytes) Send();
   }
 
   std::optional<std::size_t> ClassOfPath(ICIMInstance const& instance) const {
@@ -383,20 +418,17 @@ private:
     return true;
   }
 
-  void WriteValues() {
-    fStarts.clear();
-    for (auto const& property : fProperties) {
-      fStarts.push_back(fRecord.Bytes().size());
-      TCIMValue value;
-      auto const failure = FailureOfEnumeration([&] { value = property->GetValue(kNone); });
-      if (failure) {
-        WriteMissingValue(fRecord);
-        failure->WriteTo(fRecord);
-      } else {
-        WriteValue(fRecord, value, fSchema.Numbers());
-      }
+  void AddValue(ICIMProperty const& property) {
+    std::size_t const start = fRecord.Bytes().size();
+    fStarts.push_back(start);
+    try {
+      WriteValue(fRecord, property.GetValue(kNone), fSchema.Numbers());
+    } catch (...) {
+      auto const failure = TRecordedFailure::OfCurrentException();
+      fRecord.CutTo(start);
+      WriteMissingValue(fRecord);
+      failure.WriteTo(fRecord);
     }
-    fStarts.push_back(fRecord.Bytes().size());
   }
 
   void WritePath(ICIMInstance const& instance, std::size_t cls, TLayout const& layout) {

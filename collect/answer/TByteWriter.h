@@ -28,6 +28,7 @@ public:
 
   std::string const& Bytes() const { return fBytes; }
   void Clear() { fBytes.clear(); }
+  void CutTo(std::size_t size) { fBytes.resize(size); }  // drops what was written after that size
 
 private:
   std::string fBytes;

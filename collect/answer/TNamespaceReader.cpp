@@ -101,8 +101,8 @@ void TNamespaceReader::ReadPropertyDecl(boost::shared_ptr<TReceivedClass> const&
 void TNamespaceReader::ReadStaticProperties(boost::shared_ptr<TReceivedClass> const& cls) {
   for (std::size_t left = CountOf("the number of static properties"); left > 0; --left) {
     std::string const name = ReadText();
-    auto const decl = ReadDecl();
-    cls->Add(boost::make_shared<TReceivedProperty>(fNamespace, name, decl, ReadValuePosition()));
+    fNs.fStaticProperties.push_back({name, ReadDecl()});
+    cls->Add(boost::make_shared<TReceivedProperty>(fNamespace, fNs.fStaticProperties.back(), ReadValuePosition()));
   }
   if (auto const failure = ReadEnding()) cls->EndStaticPropertiesWith(*failure);
 }

@@ -33,9 +33,8 @@ boost::shared_ptr<ICIMClass> TReceivedInstance::GetClass(TCIMContext const&) con
 boost::shared_ptr<ICIMProperty> TReceivedInstance::GetProperty(std::string const& name, TCIMContext const&) const {
   boost::shared_ptr<TReceivedNamespace> const ns(fNamespace);
   TByteReader reader = ns->ReaderAt(fAt);
-  for (TReceivedLayout::TProperty const& property : fLayout->fProperties) {
-    if (IsSameName(property.fName, name))
-      return boost::make_shared<TReceivedProperty>(ns, property.fName, property.fDeclaration, reader.At());
+  for (TReceivedPropertyName const& property : fLayout->fProperties) {
+    if (IsSameName(property.fName, name)) return boost::make_shared<TReceivedProperty>(ns, property, reader.At());
     SkipProperty(reader);
   }
   return {};
@@ -45,8 +44,8 @@ void TReceivedInstance::EnumerateProperties(boost::function<bool(boost::shared_p
                                             TCIMContext const&) const {
   boost::shared_ptr<TReceivedNamespace> const ns(fNamespace);
   TByteReader reader = ns->ReaderAt(fAt);
-  for (TReceivedLayout::TProperty const& property : fLayout->fProperties) {
-    if (!callback(boost::make_shared<TReceivedProperty>(ns, property.fName, property.fDeclaration, reader.At()))) return;
+  for (TReceivedPropertyName const& property : fLayout->fProperties) {
+    if (!callback(boost::make_shared<TReceivedProperty>(ns, property, reader.At()))) return;
     SkipProperty(reader);
   }
 }

@@ -81,7 +81,8 @@ private:
   std::vector<std::size_t> fSupers;  // the number of the superclass plus 1, or 0; by class
   std::unordered_map<std::string, std::size_t, TNameHash, TNameEqual> fNumbers;
   std::optional<TRecordedFailure> fClassesFailure;
-  std::deque<TReceivedLayout> fLayouts;  // whose addresses are fixed
+  std::deque<TReceivedPropertyName> fStaticProperties;  // of all classes; their addresses are fixed
+  std::deque<TReceivedLayout> fLayouts;                 // the same
   std::vector<boost::shared_ptr<TReceivedInstance>> fInstances;
   std::map<std::size_t, TTree> fTrees;  // by the number of the root class
 

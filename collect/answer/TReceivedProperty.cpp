@@ -4,13 +4,7 @@
 #include "TZEPException.h"
 #include "collect/answer/TReceivedNamespace.h"
 
-#include <utility>
-
 namespace NQRVZEP20 {
-
-TReceivedProperty::TReceivedProperty(boost::weak_ptr<TReceivedNamespace> ns, std::string name,
-                                     boost::shared_ptr<ICIMPropertyDecl const> declaration, std::size_t at)
-    : fNamespace(std::move(ns)), fName(std::move(name)), fDeclaration(std::move(declaration)), fAt(at) {}
 
 TCIMValue TReceivedProperty::GetValue(TCIMContext const&) const {
   return boost::shared_ptr<TReceivedNamespace>(fNamespace)->ValueAt(fAt);
@@ -18,11 +12,15 @@ TCIMValue TReceivedProperty::GetValue(TCIMContext const&) const {
 
 void TReceivedProperty::SetValue(TCIMValue const&, TCIMContext const&) { RefuseChange(); }
 
-std::string TReceivedProperty::GetName(TCIMContext const&) const { return fName; }
+std::string TReceivedProperty::GetName(TCIMContext const&) const {
+  boost::shared_ptr<TReceivedNamespace> const ns(fNamespace);
+  return fName->fName;
+}
 
 boost::shared_ptr<ICIMPropertyDecl const> TReceivedProperty::GetDeclaration(TCIMContext const&) const {
-  if (!fDeclaration) throw TZEPException(kZEPStatusNotFound);
-  return fDeclaration;
+  boost::shared_ptr<TReceivedNamespace> const ns(fNamespace);
+  if (!fName->fDeclaration) throw TZEPException(kZEPStatusNotFound);
+  return fName->fDeclaration;
 }
 
 }  // namespace NQRVZEP20

@@ -6,16 +6,25 @@
 #include <boost/weak_ptr.hpp>
 
 #include <string>
+#include <utility>
 
 namespace NQRVZEP20 {
 
 class TReceivedNamespace;
+class TReceivedPropertyDecl;
+
+// The name of a property, and its declaration, which is empty when no class of the namespace declares it.
+struct TReceivedPropertyName {
+  std::string fName;
+  boost::shared_ptr<TReceivedPropertyDecl const> fDeclaration;
+};
 
 // A property of an instance or class of a received namespace, whose value is at a position of the bytes.
 class TReceivedProperty : public ICIMProperty {
 public:
-  TReceivedProperty(boost::weak_ptr<TReceivedNamespace> ns, std::string name,
-                    boost::shared_ptr<ICIMPropertyDecl const> declaration, std::size_t at);
+  // `name` belongs to the namespace.
+  TReceivedProperty(boost::weak_ptr<TReceivedNamespace> ns, TReceivedPropertyName const& name, std::size_t at)
+      : fNamespace(std::move(ns)), fName(&name), fAt(at) {}
 
   // Throws the exception of the provider when it could not give the value.
   TCIMValue GetValue(TCIMContext const& context) const override;
@@ -28,8 +37,7 @@ public:
 
 private:
   boost::weak_ptr<TReceivedNamespace> const fNamespace;
-  std::string const fName;
-  boost::shared_ptr<ICIMPropertyDecl const> const fDeclaration;  // may be empty
+  TReceivedPropertyName const* const fName;
   std::size_t const fAt;
 };
 
