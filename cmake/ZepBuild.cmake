@@ -17,7 +17,13 @@ set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
 
 find_program(ZEP_CCACHE ccache)
 if(ZEP_CCACHE)
-  set(CMAKE_CXX_COMPILER_LAUNCHER ${ZEP_CCACHE})
+  # Precompiled headers are cached, too. They are identified by their contents, not by their times.
+  set(CMAKE_CXX_COMPILER_LAUNCHER ${CMAKE_COMMAND} -E env CCACHE_SLOPPINESS=pch_defines,time_macros ${ZEP_CCACHE})
+  if(CMAKE_CXX_COMPILER_ID STREQUAL Clang)
+    add_compile_options("SHELL:-Xclang -fno-pch-timestamp")
+  else()
+    add_compile_options(-fpch-preprocess)
+  endif()
 endif()
 
 # The build tree resembles the installed one: libraries loaded at run time share a directory; test plug-ins are elsewhere.
@@ -85,6 +91,7 @@ function(zep_test name)
   endif()
   add_executable(${name} ${ARG_SOURCES})
   target_link_libraries(${name} PRIVATE test_support ${ARG_LIBS} GTest::gtest_main)
+  target_precompile_headers(${name} REUSE_FROM test_support)
   set_target_properties(${name} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${ZEP_TEST_DIR})
   set(properties TIMEOUT ${ARG_TIMEOUT})
   if(ARG_LABELS)

@@ -39,7 +39,7 @@ protected:
     auto const start = std::chrono::steady_clock::now();
     gResults = new TTempDir;
     gRun =
-        RunProgram("PATH=$PATH:/usr/sbin:/sbin; sh " + kVm + "run-in-vm.sh --gadgets --timeout 240 --out " + gResults->Path() +
+        RunProgram("PATH=$PATH:/usr/sbin:/sbin; sh " + kVm + "run-in-vm.sh --gadgets --timeout 700 --out " + gResults->Path() +
                    Files() + " sh " + kHere + "in-vm.sh " + ZEP_MEDIA_PROBE + " " + ZEP_PROGRAM + " " + ZEP_PULLS_OUT + " 2>&1");
     std::chrono::duration<double> const seconds = std::chrono::steady_clock::now() - start;
     std::cout << "the virtual machine took " << seconds.count() << " s\n";
