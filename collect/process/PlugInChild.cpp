@@ -154,15 +154,19 @@ boost::shared_ptr<TWatchedRegistry> WatchRegistry() {
   return registry;
 }
 
+// Whether the dynamic linker refused the library. An exception of the plug-in itself mostly ends in OnTerminate, because dlopen
+// is declared not to throw.
+bool IsOfLinker(TTimedFailure const& failure) {
+  return !failure.fReason.empty() && failure.fMessage == TZEPStatusCode(kZEPStatusFileSystemError).TranslateStatusCode();
+}
+
 void Load(TChildSetup const& setup) {
   SendStage(EStage::kOpen);
   bool const runsItsCode = CanBeMapped(setup.fFile);
   if (runsItsCode) SendStage(EStage::kConstruction);
   TTimedFailure const failure = TimedFailureOf([&] { TOSSpecific::LoadNSPLibrary(setup.fName); });
-  if (!failure.fMessage.empty()) {
-    SendStage(EStage::kOpen);  // an exception of the plug-in ends in OnTerminate
-    Send(EMessage::kFailed, failure.ReasonOrMessage());
-  }
+  if (IsOfLinker(failure)) SendStage(EStage::kOpen);
+  if (!failure.fMessage.empty()) Send(EMessage::kFailed, failure.ReasonOrMessage());
   Send(EMessage::kLoaded, std::to_string(failure.fMilliseconds));
 }
 
