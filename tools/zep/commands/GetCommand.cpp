@@ -69,6 +69,8 @@ int Get(TArguments const& arguments) {
   if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the URL comes first, the file second");
   TTarget const source = TargetOf(arguments.fUrl, false);
   if (source.fIsHost) throw TWrongUsage("a URL is needed, ftp:// or sftp://");
+  std::string const& path = source.fRemote.fPath;
+  if (path.empty() || path.back() == '/') throw TWrongUsage("the URL names a directory; add the name of a file");
   std::string const file = WithoutLinks(arguments.fFile);
   std::error_code unknown;
   fs::file_status const status = fs::symlink_status(file, unknown);

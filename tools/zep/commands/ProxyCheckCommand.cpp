@@ -16,6 +16,7 @@
 
 #include <CLI/CLI.hpp>
 
+#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <iostream>
@@ -73,8 +74,9 @@ bool IsCutAt(std::string const& file, std::uint64_t mostBytes) {
   return mostBytes > 0 && std::filesystem::file_size(file, absent) >= mostBytes && !absent;
 }
 
-// Fetches the page into the working directory.
+// Fetches the page into the working directory. libcurl would go past the proxy for the hosts in these variables.
 TZEPStatusCode FetchPage(TRemote const& proxy) {
+  for (char const* const name : {"no_proxy", "NO_PROXY"}) ::unsetenv(name);
   TProxyAnswer const answer = CheckProxy(proxy.fHost, proxy.fPort, UserAndPasswordOf(proxy));
   if (answer.fStatus == kZEPStatusOK) return kZEPStatusOK;
   throw TZEPFailure(answer.fStatus, answer.fReason.empty() ? "libcurl reports no reason" : answer.fReason);
@@ -109,6 +111,9 @@ TOutcome Check(TRemote const& proxy, TArguments const& arguments) {
   return {kZEPStatusAccessDenied, kExitNothing, "the expected page was not returned; " + AnswerIn(BeginningOf(pageFile)) + size};
 }
 
+// The final outcome: the interrupt, if there is one.
+TOutcome Decided(TOutcome const& outcome) { return IsInterruptedAtLast() ? Interrupted() : outcome; }
+
 int Tell(std::string const& proxy, TOutcome const& outcome, bool asJson, bool quiet) {
   bool const works = outcome.fExit == kExitComplete;
   if (asJson) {
@@ -130,7 +135,8 @@ int ProxyCheck(TArguments const& arguments) {
   FindPassword(proxy, arguments.fOptions.fNetrc);
   HideLogin(proxy.fUser, proxy.fPassword.View());
   TInterruptGuard const guard;
-  return Tell(Printable(proxy.fHost + ":" + proxy.fPort), Check(proxy, arguments), arguments.fAsJson, arguments.fOptions.fQuiet);
+  return Tell(Printable(proxy.fHost + ":" + proxy.fPort), Decided(Check(proxy, arguments)), arguments.fAsJson,
+              arguments.fOptions.fQuiet);
 }
 
 }  // namespace

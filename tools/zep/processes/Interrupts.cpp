@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/processes/Interrupts.h"
 
+#include "core/TNeverDestroyed.h"
 #include "tools/zep/output/Failure.h"
 
 #include <array>
+#include <optional>
 
 namespace NQRVZEP20::zep {
 
@@ -14,7 +16,9 @@ constexpr std::array<int, 3> kSignals = {SIGHUP, SIGINT, SIGTERM};
 volatile sig_atomic_t gPending = 0;
 std::array<struct sigaction, kSignals.size()> gBefore;
 
-void Remember(int signal) { gPending = signal; }
+void Remember(int signal) {
+  if (gPending == 0) gPending = signal;
+}
 
 }  // namespace
 
@@ -43,6 +47,14 @@ TInterruptsBlocked::TInterruptsBlocked() {
 TInterruptsBlocked::~TInterruptsBlocked() { ::sigprocmask(SIG_SETMASK, &fBefore, nullptr); }
 
 int PendingInterrupt() { return gPending; }
+
+bool IsInterruptedAtLast() {
+  static TNeverDestroyed<std::optional<TInterruptsBlocked>> blocked;
+  blocked->emplace();
+  bool const isPending = PendingInterrupt() != 0;
+  if (isPending) blocked->reset();
+  return isPending;
+}
 
 EExitStatus StatusOfInterrupt() {
   switch (gPending) {

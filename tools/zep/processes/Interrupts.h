@@ -11,7 +11,7 @@ namespace NQRVZEP20::zep {
 
 // While a guard exists, SIGHUP, SIGINT and SIGTERM do not end zep at once, so that it can remove what it made and report what is
 // left. They interrupt blocking calls, and have their effect at the end of the guard: a guard must therefore outlive the handler
-// that prints the message. A signal that is ignored stays ignored.
+// that prints the message. Of several signals only the first one counts. A signal that is ignored stays ignored.
 class TInterruptGuard {
 public:
   TInterruptGuard();
@@ -35,6 +35,10 @@ private:
 
 // The signal that arrived and has not had its effect yet; 0 when there is none.
 int PendingInterrupt();
+
+// Called when only the outcome is left to be printed. Returns true when an interrupt is pending, which then ends zep. Otherwise
+// no interrupt has an effect from now on, and zep ends with the status that it prints.
+bool IsInterruptedAtLast();
 
 // The exit status that a document gives for the pending interrupt.
 EExitStatus StatusOfInterrupt();

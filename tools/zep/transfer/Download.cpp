@@ -9,6 +9,7 @@
 
 #include <fcntl.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <cerrno>
 #include <cstring>
@@ -38,7 +39,8 @@ public:
     bool const isWholeTooLarge = code == CURLE_OK && fMostBytes > 0 && fStart > fMostBytes;
     if (code == CURLE_FILESIZE_EXCEEDED || isWholeTooLarge) fState.fIsTooLarge = true;
     if (fState.fIsTooLarge) FailFor(code);
-    if (code == CURLE_OK && !fFile) Open();  // of an empty remote file no byte comes
+    if (code == CURLE_OK && !fFile) OpenPart(static_cast<std::int64_t>(fStart));  // an empty file, or nothing was missing
+    if (code == CURLE_OK && fError == 0) Flush();
     if (code != CURLE_OK || fError != 0) FailFor(code);
   }
 
@@ -76,15 +78,30 @@ private:
     std::int64_t const toCome = fConnection.BytesToCome();
     std::int64_t const size = toCome < 0 ? -1 : toCome + static_cast<std::int64_t>(fStart);
     fIsOther = fStart > 0 && !IsPartOf(size);
-    if (fIsOther) return false;
+    return !fIsOther && OpenPart(size);
+  }
+
+  // Opens the part of a remote file of that size (-1: unknown). False with fError.
+  bool OpenPart(std::int64_t size) {
     int const how = fStart > 0 ? O_APPEND : fIsThere ? O_CREAT | O_TRUNC : O_CREAT | O_EXCL;
     fFile = TUniqueFd(::open(fPath.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC | how, kModeOfPart));
     if (!fFile) fError = errno;
     if (!fFile) return false;
+    struct stat opened {};
+    ::fstat(fFile.get(), &opened);
+    fState.fDevice = opened.st_dev;
+    fState.fInode = opened.st_ino;
     ::fchmod(fFile.get(), kModeOfPart);  // of an earlier part; a file system without modes refuses it
     if (fStart == 0) WriteNote(fPath, NoteFor(fShownUrl, size));
     fState.fRemoteTime = fConnection.RemoteTime();  // only now is it the time of what the part holds
     return true;
+  }
+
+  // Some file systems report only now that a byte could not be written. Those that have no fsync say EINVAL.
+  void Flush() {
+    fState.fIsFinishing = true;
+    if (::fsync(fFile.get()) != 0 && errno != EINVAL) fError = errno;
+    fState.fIsFinishing = false;
   }
 
   // libcurl's write callback. Another result than the number of bytes ends the transfer.

@@ -3,6 +3,8 @@
 
 #include "TZEPFailure.h"
 
+#include <poll.h>
+
 namespace NQRVZEP20::zep {
 
 TConnection::TConnection() {
@@ -46,6 +48,13 @@ std::int64_t TConnection::RemoteTime() const {
 std::int64_t TConnection::BytesToCome() const {
   curl_off_t bytes = -1;
   return fCurl->fGetInfo(fHandle, CURLINFO_CONTENT_LENGTH_DOWNLOAD_T, &bytes) == CURLE_OK ? bytes : -1;
+}
+
+bool TConnection::IsLost() const {
+  curl_socket_t socket = CURL_SOCKET_BAD;
+  fCurl->fGetInfo(fHandle, CURLINFO_ACTIVESOCKET, &socket);
+  pollfd end{socket, POLLRDHUP, 0};
+  return socket == CURL_SOCKET_BAD || ::poll(&end, 1, 0) > 0;
 }
 
 void TConnection::FailFor(CURLcode code, std::string const& errorText) {

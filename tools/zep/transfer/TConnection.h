@@ -52,6 +52,9 @@ public:
   // The size of what the last transfer fetches, in bytes; -1 when the server does not report it. 0 also when it fetches nothing.
   std::int64_t BytesToCome() const;
 
+  // Whether the connection of the last transfer has ended.
+  bool IsLost() const;
+
   // libcurl's text for a failed transfer; may be empty.
   std::string ErrorText() const { return fError.data(); }
 

@@ -2,7 +2,6 @@
 #include "tools/zep/transfer/Transfer.h"
 
 #include "core/Handles.h"
-#include "core/TNeverDestroyed.h"
 #include "os/RemotePath.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Output.h"
@@ -10,7 +9,6 @@
 #include "tools/zep/output/Text.h"
 #include "tools/zep/processes/Interrupts.h"
 #include "tools/zep/processes/TChildProcess.h"
-#include "tools/zep/processes/WriteWhole.h"
 #include "tools/zep/secrets/Secrets.h"
 #include "tools/zep/transfer/Download.h"
 #include "tools/zep/transfer/PartNote.h"
@@ -38,7 +36,6 @@
 #include <filesystem>
 #include <iostream>
 #include <limits>
-#include <optional>
 #include <string_view>
 #include <vector>
 
@@ -57,13 +54,13 @@ class TProgress {
 public:
   TProgress(std::uint64_t total, bool isWanted) : fTotal(total), fIsShown(isWanted && CanRedrawErrors()) {}
   ~TProgress() {
-    if (fIsShown) std::cerr << "\r\x1b[K" << std::flush;
+    if (fIsShown && CanWrite()) std::cerr << "\r\x1b[K" << std::flush;
   }
   TProgress(TProgress const&) = delete;
   TProgress& operator=(TProgress const&) = delete;
 
   void Show(std::uint64_t bytes) {
-    if (!fIsShown) return;
+    if (!fIsShown || !CanWrite()) return;
     double const seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - fStart).count();
     std::string line = "\r\x1b[K";
     if (fTotal > 0) line += Bar(bytes) + " of " + SizeText(fTotal) + ", ";
@@ -72,6 +69,12 @@ public:
   }
 
 private:
+  // Whether the terminal takes a line at once. After Ctrl-S it takes none, and zep would not notice that a transfer has ended.
+  static bool CanWrite() {
+    pollfd errors{STDERR_FILENO, POLLOUT, 0};
+    return ::poll(&errors, 1, 0) > 0;
+  }
+
   std::string Bar(std::uint64_t bytes) const {
     constexpr std::uint64_t kWidth = 30;
     std::uint64_t const share = std::min(bytes, fTotal);
@@ -91,6 +94,7 @@ TOutcome Transfer(std::function<TZEPStatusCode()> const& transfer, TTransferStat
   TWatch watch;
   watch.fMoved = &state.fMoved;
   watch.fStallSeconds = options.fStallSeconds;
+  watch.fIsFinishing = &state.fIsFinishing;
   watch.fShowProgress = [&progress](std::uint64_t bytes) { progress.Show(bytes); };
   return RunWatched(transfer, watch);
 }
@@ -117,16 +121,6 @@ TTransferred TransferOf(TRemote const& remote, std::string const& file) {
 TTransferred Failed(TTransferred transferred, EExitStatus exit, std::string const& reason) {
   transferred.fOutcome = {kZEPStatusFail, exit, reason};
   return transferred;
-}
-
-// Called when only the outcome is left to be printed. Returns true when an interrupt is pending, which then ends zep. Otherwise
-// no interrupt has an effect from now on, and zep ends with the status that it prints.
-bool IsInterruptedAtLast() {
-  static TNeverDestroyed<std::optional<TInterruptsBlocked>> blocked;
-  blocked->emplace();
-  bool const isPending = PendingInterrupt() != 0;
-  if (isPending) blocked->reset();
-  return isPending;
 }
 
 // The transfer with its final outcome: the interrupt, if there is one.
@@ -225,6 +219,18 @@ std::string JoinedByAnd(std::vector<std::string> const& texts) {
   return joined;
 }
 
+// What an upload that failed has done to the earlier file.
+std::string LossText(EEarlierFile earlier) {
+  switch (earlier) {
+    case EEarlierFile::kIsLost:
+      return "; the earlier file of that name is lost";
+    case EEarlierFile::kMayBeLost:
+      return "; if there was an earlier file of that name, it is lost";
+    default:
+      return "";
+  }
+}
+
 // Adds what is known of an upload besides its outcome: why its file could not be read, and what may be left on the server.
 void ExplainUpload(TTransferred& transferred, TRemote const& place, TUploadNames const& names, TTransferState const& state) {
   TOutcome& outcome = transferred.fOutcome;
@@ -234,6 +240,8 @@ void ExplainUpload(TTransferred& transferred, TRemote const& place, TUploadNames
   if (state.fLeft & kLeftTemporary) left.push_back(ShownUrlOf(Beside(place, names.fTemporary)));
   if (state.fLeft & kLeftAtPlace) left.push_back(ShownUrlOf(place));
   if (!isComplete && !left.empty()) outcome.fReason += "; the server may have a part of it: " + JoinedByAnd(left);
+  if (!isComplete && (state.fLeft & kMayBeRenamed)) outcome.fReason += ", or the complete file: " + ShownUrlOf(place);
+  if (!isComplete) outcome.fReason += LossText(state.fEarlierFile);
   if ((state.fLeft & kLeftFormer) == 0) return;
   transferred.fFormerUrl = ShownUrlOf(Beside(place, names.fFormer));
   left.push_back(transferred.fFormerUrl);
@@ -320,30 +328,6 @@ void SetMode(std::string const& path, mode_t mode) {
   if (file) ::fchmod(file.get(), mode);
 }
 
-// Whether more could be written to the part. False, with errno set, on a full disk. A part that is missing, or that is a
-// symbolic link by now, reveals nothing about the disk.
-bool CanGrow(std::string const& path) {
-  TUniqueFd const file(::open(path.c_str(), O_WRONLY | O_APPEND | O_NOFOLLOW | O_CLOEXEC));
-  if (!file) return errno == ENOENT || errno == ELOOP;
-  struct stat before {};
-  ::fstat(file.get(), &before);
-  off_t const size = ::lseek(file.get(), 0, SEEK_END);
-  bool const isWritten = WriteWhole(file.get(), std::string(4096, '\0'));
-  int const error = errno;
-  if (::ftruncate(file.get(), size) != 0) return false;
-  timespec const times[] = {before.st_atim, before.st_mtim};
-  ::futimens(file.get(), times);  // which may tell where it came from (MarkForResuming)
-  errno = error;
-  return isWritten;
-}
-
-// Makes a failed transfer one of the local disk, when that is the cause.
-void BlameTheDisk(TOutcome& outcome, std::string const& part) {
-  if (outcome.fExit != kExitNothing || CanGrow(part)) return;
-  outcome.fExit = kExitNotWritten;
-  outcome.fReason = ReasonOf(errno);
-}
-
 // What there is of a file that did not arrive.
 std::string PartText(std::string const& part) {
   std::error_code absent;
@@ -376,21 +360,27 @@ TTransferred BrokenOff(TTransferred transferred, bool wasThere, TTransferState c
     bool const isKept = wasThere || (::unlink(part.c_str()) != 0 && errno != ENOENT);
     if (!isKept) RemoveNote(part);
     if (!isKept) return transferred;
-  } else {
-    BlameTheDisk(transferred.fOutcome, part);
   }
+  if (transferred.fOutcome.fStatus == kZEPStatusFileSystemError) transferred.fOutcome.fExit = kExitNotWritten;
   MarkForResuming(part, state);
   transferred.fOutcome.fReason += PartText(part);
   return transferred;
 }
 
+// Whether the part is still the file that the download wrote, with all that arrived.
+bool IsAsWritten(std::string const& part, TTransferState const& state) {
+  struct stat status {};
+  return ::lstat(part.c_str(), &status) == 0 && S_ISREG(status.st_mode) && status.st_dev == state.fDevice &&
+         status.st_ino == state.fInode && static_cast<std::uint64_t>(status.st_size) == state.fMoved;
+}
+
 // Gives the part, which is complete, the name of the file. An interrupt before that leaves the part.
 TTransferred Completed(TTransferred transferred, std::string const& file, bool overwrites, TTransferState const& state) {
   std::string const& part = transferred.fFile;
-  // An empty file does not arrive at all.
-  if (!fs::exists(part) && !MakeEmptyFile(part)) return Failed(transferred, kExitNotWritten, ReasonOf(errno));
-  transferred.fBytes = fs::file_size(part);
-  transferred.fSha256 = Sha256Of(part);
+  transferred.fBytes = state.fMoved;
+  if (IsAsWritten(part, state)) transferred.fSha256 = Sha256Of(part);
+  if (!IsAsWritten(part, state))
+    return Decided(Failed(transferred, kExitNotWritten, "another program changed or removed this file during the download"));
   if (IsInterruptedAtLast()) {
     MarkForResuming(part, state);
     return Failed(transferred, StatusOfInterrupt(), "interrupted" + PartText(part));

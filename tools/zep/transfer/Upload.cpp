@@ -25,7 +25,8 @@ using TClock = std::chrono::steady_clock;
 struct TSource {
   TUniqueFd fFile;
   TTransferState& fState;
-  unsigned fMark;  // of fState.fLeft
+  unsigned fMark;         // of fState.fLeft
+  EEarlierFile fEarlier;  // of fState.fEarlierFile, once the server has begun to write
 };
 
 // libcurl's callback before a transfer whose connection is there. A libcurl before 7.80 has none; ReadSource has to do.
@@ -39,12 +40,14 @@ int MarkBegun(void* context, char*, char*, int, int) {
 std::size_t ReadSource(char* bytes, std::size_t size, std::size_t count, void* context) {
   TSource& source = *static_cast<TSource*>(context);
   source.fState.fLeft |= source.fMark;
+  source.fState.fEarlierFile = source.fEarlier;
   ssize_t got = -1;
   while ((got = ::read(source.fFile.get(), bytes, size * count)) < 0 && errno == EINTR) continue;
   if (got < 0) {
     source.fState.fReadError = errno;
     return CURL_READFUNC_ABORT;
   }
+  if (got == 0 && source.fMark == kLeftTemporary) source.fState.fLeft |= kMayBeRenamed;
   source.fState.fMoved += static_cast<std::uint64_t>(got);
   return static_cast<std::size_t>(got);
 }
@@ -144,10 +147,11 @@ public:
   void Run() {
     if (HasControlCharacter(fNames.Name())) return SendToThePlace();  // which libcurl refuses
     std::string const& temporary = fOthers.fTemporary;
-    CURLcode const code = Send(fNames.UrlOfOther(temporary), fNames.Renaming(temporary, fNames.Name()), kLeftTemporary);
-    if (code == CURLE_OK) return SetLeft(kLeftTemporary, false);
-    if (code == CURLE_QUOTE_ERROR) return ReplaceOrSendAnew();
-    if (!IsNothingWritten(code)) GiveUp(code, fConnection.ErrorText());
+    CURLcode const code =
+        Send(fNames.UrlOfOther(temporary), fNames.Renaming(temporary, fNames.Name()), kLeftTemporary, EEarlierFile::kIsThere);
+    if (code == CURLE_OK) return SetLeft(kLeftTemporary | kMayBeRenamed, false);
+    if (code == CURLE_QUOTE_ERROR && IsRefusal(code)) return ReplaceOrSendAnew();
+    if (!IsNothingWritten(code)) GiveUp(code, Reason(code));
     SetLeft(kLeftTemporary, false);
     SendToThePlace();
   }
@@ -159,27 +163,30 @@ public:
     bool const isNotComplete = fState.fLeft & (kLeftTemporary | kLeftAtPlace | kLeftPlaceEmpty);
     if ((fState.fLeft & kLeftAtPlace) && fState.fMoved > 0) Remove(fNames.Name(), kLeftAtPlace);
     if ((fState.fLeft & kLeftFormer) && isNotComplete) RestoreFormer();
-    if (fState.fLeft & kLeftTemporary) Remove(fOthers.fTemporary, kLeftTemporary);
+    if (fState.fLeft & kLeftTemporary) Remove(fOthers.fTemporary, kLeftTemporary | kMayBeRenamed);
   }
 
 private:
-  static bool IsRefusal(CURLcode code) {
-    return code == CURLE_UPLOAD_FAILED || code == CURLE_REMOTE_ACCESS_DENIED || code == CURLE_REMOTE_FILE_EXISTS ||
-           code == CURLE_REMOTE_FILE_NOT_FOUND || code == CURLE_SSH;
+  // Whether the server refused the transfer. libcurl gives the same codes for an SFTP connection that was lost: the server may
+  // then have done what it did not answer.
+  bool IsRefusal(CURLcode code) const {
+    bool const isCode = code == CURLE_UPLOAD_FAILED || code == CURLE_REMOTE_ACCESS_DENIED || code == CURLE_REMOTE_FILE_EXISTS ||
+                        code == CURLE_REMOTE_FILE_NOT_FOUND || code == CURLE_SSH || code == CURLE_QUOTE_ERROR;
+    return isCode && !(fNames.IsSftp() && fConnection.IsLost());
   }
 
   bool IsNothingWritten(CURLcode code) const { return fState.fMoved == 0 && fState.fReadError == 0 && IsRefusal(code); }
 
-  void SetLeft(ELeft what, bool isLeft) {
+  void SetLeft(unsigned what, bool isLeft) {
     if (isLeft)
       fState.fLeft |= what;
     else
-      fState.fLeft &= ~static_cast<unsigned>(what);
+      fState.fLeft &= ~what;
   }
 
-  // Once the server may have begun to write, `mark` is set in fLeft.
-  CURLcode Send(std::string const& url, TCommands const& commandsAfter, ELeft mark) {
-    TSource source{TUniqueFd(::open(fFile.c_str(), O_RDONLY | O_CLOEXEC)), fState, mark};
+  // Once the server may have begun to write, `mark` is set in fLeft; once it has, `earlier` in fEarlierFile.
+  CURLcode Send(std::string const& url, TCommands const& commandsAfter, ELeft mark, EEarlierFile earlier) {
+    TSource source{TUniqueFd(::open(fFile.c_str(), O_RDONLY | O_CLOEXEC)), fState, mark, earlier};
     if (!source.fFile) {
       fState.fReadError = errno;
       return CURLE_READ_ERROR;
@@ -199,6 +206,7 @@ private:
   // From now on the commands, taken together, have fCleanUpSeconds.
   void StartCleanUp() {
     fIsCleanUp = true;
+    fState.fIsFinishing = true;
     fCleanUpEnd = TClock::now() + std::chrono::seconds(fCleanUpSeconds);
   }
 
@@ -223,7 +231,7 @@ private:
     return fConnection.Perform(fNames.DirectoryUrl());
   }
 
-  void Remove(std::string const& name, ELeft what) {
+  void Remove(std::string const& name, unsigned what) {
     if (Command(fNames.Removal(name)) == CURLE_OK) SetLeft(what, false);
   }
 
@@ -300,12 +308,14 @@ private:
 
   // The file has arrived, but did not get its name. Some servers do not rename onto another file.
   void ReplaceOrSendAnew() {
+    SetLeft(kMayBeRenamed, false);
     TAtPlace const found = LookAtPlace();
     if (found.fFailure != CURLE_OK) GiveUp(found.fFailure, fConnection.ErrorText());
     if (found.fKind == TAtPlace::kDirectory) FailForDirectory();
     if (found.fKind == TAtPlace::kOther) FailFor(" is not a regular file; remove it first, or choose another name");
     if (found.fKind == TAtPlace::kFile && Replace(found.fMode)) return;
     fIsPlaceUnknown = found.fKind == TAtPlace::kUnknown;
+    fIsFileAtPlace = found.fKind == TAtPlace::kFile;
     Remove(fOthers.fTemporary, kLeftTemporary);
     fState.fMoved = 0;
     SendToThePlace();
@@ -321,7 +331,10 @@ private:
     }
     TCommands commands = fNames.Renaming(temporary, name);
     if (mode >= 0) commands.insert(commands.begin(), fNames.ChangeOfMode(temporary, mode));
-    if (!IsDone(Command(commands))) {
+    SetLeft(kMayBeRenamed, true);
+    bool const isRenamed = IsDone(Command(commands));
+    SetLeft(kMayBeRenamed, false);
+    if (!isRenamed) {
       SetLeft(kLeftPlaceEmpty, true);
       RestoreFormer();
       return false;
@@ -334,21 +347,35 @@ private:
 
   // Whether the server executed the commands; false when it refused one. Fails when the connection was lost.
   bool IsDone(CURLcode code) {
-    if (code != CURLE_OK && code != CURLE_QUOTE_ERROR) GiveUp(code, fConnection.ErrorText());
+    bool const isRefused = code == CURLE_QUOTE_ERROR && IsRefusal(code);
+    if (code != CURLE_OK && !isRefused) GiveUp(code, Reason(code));
     return code == CURLE_OK;
   }
 
+  // Why a transfer failed. libcurl's text for a lost SFTP connection names another cause.
+  std::string Reason(CURLcode code) const {
+    bool const isLost = code == CURLE_QUOTE_ERROR && !IsRefusal(code);
+    return isLost ? "the connection was lost before the server answered" : fConnection.ErrorText();
+  }
+
   void SendToThePlace() {
-    CURLcode const code = Send(fNames.Url(), {}, kLeftAtPlace);
+    CURLcode const code = Send(fNames.Url(), {}, kLeftAtPlace, EarlierFileWhenWritten());
     bool const isRefused = IsNothingWritten(code);
     if (code == CURLE_OK || isRefused) SetLeft(kLeftAtPlace, false);
     std::string const reason = fConnection.ErrorText();
     if (isRefused && LookAtPlace().fKind == TAtPlace::kDirectory) FailForDirectory();
     std::string const remedy = "; if " + fNames.Name() + " is a directory, end the URL with \"/\"";
     if (code != CURLE_OK) GiveUp(code, reason + (isRefused && fIsPlaceUnknown ? remedy : ""));
+    fState.fEarlierFile = EEarlierFile::kIsThere;
     SetLeft(kLeftPlaceEmpty, false);
     StartCleanUp();
     if (fState.fLeft & kLeftFormer) Remove(fOthers.fFormer, kLeftFormer);
+  }
+
+  // What becomes of the file at the place when the server writes to it. A file that made way is not at the place.
+  EEarlierFile EarlierFileWhenWritten() const {
+    if (fState.fLeft & kLeftFormer) return EEarlierFile::kIsThere;
+    return fIsFileAtPlace ? EEarlierFile::kIsLost : EEarlierFile::kMayBeLost;
   }
 
   // ---- Failures ----
@@ -374,6 +401,7 @@ private:
   bool fIsCleanUp = false;
   TClock::time_point fCleanUpEnd;  // no command of the clean-up begins after it
   bool fIsPlaceUnknown = false;    // a thing at the place may be a file or a directory
+  bool fIsFileAtPlace = false;     // the server has proved that
   TTransferState& fState;
 };
 

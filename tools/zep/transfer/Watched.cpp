@@ -116,7 +116,8 @@ bool ReadReport(TChildProcess& child, TWatch const& watch, std::string& report) 
     }
     std::uint64_t const now = BytesMoved(watch);
     if (watch.fShowProgress) watch.fShowProgress(now);
-    if (now != last) lastMoved = TClock::now();
+    bool const isFinishing = watch.fIsFinishing != nullptr && *watch.fIsFinishing;
+    if (now != last || isFinishing) lastMoved = TClock::now();
     last = now;
     if (watch.fStallSeconds > 0 && TClock::now() - lastMoved > std::chrono::seconds(watch.fStallSeconds)) return false;
   }
@@ -130,8 +131,8 @@ TOutcome RunWatched(std::function<TZEPStatusCode()> const& transfer, TWatch cons
   TChildProcess child([&] { return ReportOfSilent(transfer, watch.fMostBytes); }, SIGKILL);  // a transfer does not outlive zep
   std::string report;
   if (!ReadReport(child, watch, report)) return PendingInterrupt() != 0 ? Interrupted() : Stalled(watch);
-  child.End();
-  if (PendingInterrupt() != 0) return Interrupted();  // which may have ended the process as well
+  bool const isWhole = child.End();
+  if (!isWhole && PendingInterrupt() != 0) return Interrupted();  // which may have ended the process as well
   return OutcomeOf(report);
 }
 

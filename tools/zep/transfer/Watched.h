@@ -22,6 +22,7 @@ struct TWatch {
   int fStallSeconds = kUsualStallSeconds;
   std::uint64_t fMostBytes = 0;                            // the largest file that the transfer may write; 0: any
   std::function<void(std::uint64_t bytes)> fShowProgress;  // of these, now and then; may be empty
+  std::atomic<bool> const* fIsFinishing = nullptr;         // shared like fMoved: while it is true, no standstill counts
 };
 
 struct TOutcome {

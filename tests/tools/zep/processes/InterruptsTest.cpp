@@ -22,6 +22,18 @@ TEST(InterruptsTest, ASignalTakesEffectAtTheEndOfTheGuard) {
         testing::KilledBySignal(signal), "^pending$");
 }
 
+TEST(InterruptsTest, TheFirstOfSeveralSignalsCounts) {
+  EXPECT_EXIT(
+      {
+        for (int const signal : {SIGINT, SIGTERM}) ::signal(signal, SIG_DFL);
+        TInterruptGuard const guard;
+        ::raise(SIGINT);
+        ::raise(SIGTERM);
+        std::cerr << StatusOfInterrupt();
+      },
+      testing::KilledBySignal(SIGINT), "^130$");
+}
+
 // nohup starts programs with ignored signals, and so does a shell that starts them in the background.
 TEST(InterruptsTest, AnIgnoredSignalStaysIgnored) {
   for (int const signal : {SIGHUP, SIGINT, SIGTERM})
