@@ -47,6 +47,29 @@ private:
   std::string fNumber;
 };
 
+// A TCP port of loopback at which no connection is refused and none gets an answer, as behind a firewall that drops packets: the
+// only connection that may wait is there already.
+class TSilentPort {
+public:
+  TSilentPort()
+      : fSocket(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0)), fWaiting(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0)) {
+    sockaddr_in name{};
+    name.sin_family = AF_INET;
+    name.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+    socklen_t size = sizeof name;
+    auto* const address = reinterpret_cast<sockaddr*>(&name);
+    bool const isBound = ::bind(fSocket.get(), address, size) == 0 && ::getsockname(fSocket.get(), address, &size) == 0;
+    if (!isBound || ::listen(fSocket.get(), 0) != 0 || ::connect(fWaiting.get(), address, size) != 0)
+      throw std::runtime_error("no port");
+    fNumber = std::to_string(ntohs(name.sin_port));
+  }
+  std::string const& Number() const { return fNumber; }
+
+private:
+  TUniqueFd fSocket, fWaiting;
+  std::string fNumber;
+};
+
 // A script of tests/system/transfer/servers, which runs from the construction to the destruction. It prints one line of
 // NAME=VALUE words when it is ready. A port that somebody else was quicker to take is no failure: it tries again.
 class TServer {

@@ -82,14 +82,19 @@ TZEPStatusCode FetchPage(TRemote const& proxy) {
   throw TZEPFailure(answer.fStatus, answer.fReason.empty() ? "libcurl reports no reason" : answer.fReason);
 }
 
-// Replaces libcurl's message, which names no remedy.
+bool HasContent(std::string const& file) {
+  std::error_code absent;
+  return std::filesystem::file_size(file, absent) > 0 && !absent;
+}
+
+// Replaces libcurl's message, which names no remedy, or that of a standstill.
 void ExplainNoConnection(TOutcome& outcome, TRemote const& proxy) {
   constexpr int kProbeSeconds = 3;
   std::string const why = WhyUnreachable(proxy.fHost, proxy.fPort, kProbeSeconds);
   if (PendingInterrupt() != 0)
     outcome = Interrupted();
   else if (!why.empty())
-    outcome.fReason = Printable(why);
+    outcome = {kZEPStatusConnectionFailed, kExitNoConnection, Printable(why)};
 }
 
 // The proxy may return a page of its own, such as a refusal, so the page is searched for its text.
@@ -104,7 +109,8 @@ TOutcome Check(TRemote const& proxy, TArguments const& arguments) {
       },
       watch);
   bool const isCut = outcome.fExit == kExitNothing && IsCutAt(pageFile, arguments.fMostBytes);
-  if (outcome.fExit == kExitNoConnection) ExplainNoConnection(outcome, proxy);
+  bool const isSilent = outcome.fExit == kExitStalled && !HasContent(pageFile);
+  if (outcome.fExit == kExitNoConnection || isSilent) ExplainNoConnection(outcome, proxy);
   if (outcome.fExit != kExitComplete && !isCut) return outcome;
   if (HoldsText(pageFile, ZEP_PROXY_CHECK_TEXT)) return {};
   std::string const size = isCut ? ", and is larger than " + ExactSizeText(arguments.fMostBytes) + " (--max-page)" : "";

@@ -7,6 +7,7 @@
 #include <signal.h>
 #include <sys/prctl.h>
 #include <sys/wait.h>
+#include <unistd.h>
 
 #include <system_error>
 
@@ -30,8 +31,9 @@ pid_t ForkOrThrow() {
   return child;
 }
 
-[[noreturn]] void WorkInChild(std::function<void(TSend const&)> const& work, int signalOfOrphan, int output) {
+[[noreturn]] void WorkInChild(std::function<void(TSend const&)> const& work, pid_t owner, int signalOfOrphan, int output) {
   ::prctl(PR_SET_PDEATHSIG, signalOfOrphan);
+  if (::getppid() != owner) ::raise(signalOfOrphan);  // it had died before
   try {
     work([output](std::string_view text) {
       if (!WriteWhole(output, text)) throw std::system_error(errno, std::generic_category(), "the result cannot be sent");
@@ -49,8 +51,9 @@ TChildProcess::TChildProcess(std::function<std::string()> const& work, int signa
 
 TChildProcess::TChildProcess(std::function<void(TSend const&)> const& work, int signalOfOrphan) {
   TPipe pipe = PipeOrThrow();
+  pid_t const owner = ::getpid();
   fId = ForkOrThrow();
-  if (fId == 0) WorkInChild(work, signalOfOrphan, pipe.fWriteEnd.get());
+  if (fId == 0) WorkInChild(work, owner, signalOfOrphan, pipe.fWriteEnd.get());
   fOutput = std::move(pipe.fReadEnd);
 }
 

@@ -99,16 +99,18 @@ TOutcome Transfer(std::function<TZEPStatusCode()> const& transfer, TTransferStat
   return RunWatched(transfer, watch);
 }
 
-// Says more of a connection that failed than the library does: which of the ways it was.
-void ExplainNoConnection(TOutcome& outcome, TRemote const& remote) {
+// Adds why the connection failed, which the library does not report. A host that does not answer at all shows as a standstill in
+// which nothing moved.
+void ExplainNoConnection(TOutcome& outcome, TRemote const& remote, bool isNothingMoved) {
   constexpr int kProbeSeconds = 3;
-  if (outcome.fExit != kExitNoConnection) return;
+  bool const isStandstill = outcome.fExit == kExitStalled && isNothingMoved;
+  if (outcome.fExit != kExitNoConnection && !isStandstill) return;
   std::string const usualPort = remote.fScheme == "sftp" ? "22" : "21";
   std::string const why = WhyUnreachable(remote.fHost, remote.fPort.empty() ? usualPort : remote.fPort, kProbeSeconds);
   if (PendingInterrupt() != 0)
     outcome = Interrupted();
   else if (!why.empty())
-    outcome.fReason += ": " + Printable(why);
+    outcome = {kZEPStatusConnectionFailed, kExitNoConnection, outcome.fReason + ": " + Printable(why)};
 }
 
 TTransferred TransferOf(TRemote const& remote, std::string const& file) {
@@ -263,7 +265,8 @@ public:
   }
   ~TLockFile() {
     struct stat held {};
-    if (fFile && ::fstat(fFile.get(), &held) == 0 && held.st_size == 0) ::unlink(fPath.c_str());
+    bool const isEmpty = fFile && ::fstat(fFile.get(), &held) == 0 && held.st_size == 0;
+    if (isEmpty && IsStillThere()) ::unlink(fPath.c_str());
   }
   TLockFile(TLockFile const&) = delete;
   TLockFile& operator=(TLockFile const&) = delete;
@@ -386,8 +389,11 @@ TTransferred Completed(TTransferred transferred, std::string const& file, bool o
     return Failed(transferred, StatusOfInterrupt(), "interrupted" + PartText(part));
   }
   SetMode(part, ModeFor(file));
-  if (!Rename(part, file, overwrites))
-    return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + ReasonOf(errno));
+  if (!Rename(part, file, overwrites)) {
+    std::string const reason = ReasonOf(errno);
+    SetMode(part, kModeOfPart);
+    return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + reason);
+  }
   RemoveNote(part);
   transferred.fFile = file;
   return transferred;
@@ -462,7 +468,7 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
   bool const wasEnded = exit == kExitStalled || exit >= kExitHangUp;
   if (wasEnded && (state->fLeft & (kLeftTemporary | kLeftAtPlace | kLeftPlaceEmpty)))
     CleanUp(place, names, CleanUpSecondsAfterEnd(options), *state);
-  ExplainNoConnection(transferred.fOutcome, place);
+  ExplainNoConnection(transferred.fOutcome, place, state->fMoved == 0 && state->fLeft == 0);
   ExplainUpload(transferred, place, names, *state);
   if (exit != kExitComplete) return Decided(transferred);
   bool const isAsBefore = IsAsBefore(file, before);
@@ -487,7 +493,7 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
   TSharedTransferState const state;
   std::uint64_t const most = options.fMostBytes;
   transferred.fOutcome = Transfer([&] { return Download(remote, part, isThere, most, *state); }, *state, 0, options);
-  ExplainNoConnection(transferred.fOutcome, remote);
+  ExplainNoConnection(transferred.fOutcome, remote, state->fInode == 0);
   if (transferred.fOutcome.fExit != kExitComplete) return Decided(BrokenOff(transferred, isThere, *state, options));
   return Completed(transferred, file, overwrites, *state);
 }
