@@ -11,7 +11,9 @@
 #include "tools/zep/secrets/Password.h"
 #include "tools/zep/secrets/Secrets.h"
 
+#include <fcntl.h>
 #include <signal.h>
+#include <unistd.h>
 #include <CLI/CLI.hpp>
 
 #include <algorithm>
@@ -244,11 +246,20 @@ int RunOrFail(std::vector<std::string> const& words) {
   }
 }
 
+// Where the caller has closed standard input, output or error, no file that zep opens may take its place. Writing to these still
+// fails.
+void FillStandardDescriptors() {
+  int fd = -1;
+  while ((fd = ::open("/dev/null", O_RDONLY)) >= 0 && fd <= STDERR_FILENO) continue;
+  if (fd > STDERR_FILENO) ::close(fd);
+}
+
 }  // namespace
 
 }  // namespace NQRVZEP20::zep
 
 int main(int argc, char** argv) {
+  NQRVZEP20::zep::FillStandardDescriptors();
   NQRVZEP20::zep::SetSignals();
   std::vector<std::string> const words(argv + 1, argv + argc);
   NQRVZEP20::zep::KeepSecrets(words);

@@ -139,6 +139,13 @@ TEST_F(ZepTransferTest, PrintsADocument) {
   EXPECT_EQ(document["reason"], "Error performing command: The file does not exist; nothing arrived");
 }
 
+TEST_F(ZepTransferTest, ATransferNeedsNoStandardDescriptors) {
+  std::string const file = Local("f", "text");
+  EXPECT_EQ(RunProgram(kZep + "send --quiet " + file + " " + Url("f") + " <&- >&- 2>&-").exitCode, kComplete);
+  EXPECT_EQ(RunProgram(kZep + "get --quiet " + Url("f") + " " + fDir.Path("back") + " <&- >&- 2>&-").exitCode, kComplete);
+  EXPECT_EQ(ReadFile(fDir.Path("back")), "text");
+}
+
 TEST_F(ZepTransferTest, AnEmptyFileArrives) {
   EXPECT_EQ(Zep("send " + Local("empty", "") + " " + Url("")).exitCode, kComplete);
   EXPECT_EQ(Zep("get " + Url("empty") + " " + fDir.Path("back")).exitCode, kComplete);
@@ -662,7 +669,9 @@ TEST_F(ZepCleanUpTest, AfterAnInterruptItEndsAfterItsTimeOrAtASecondInterrupt) {
     auto const isCleaningUp = [&] { return CountOf("PASS ", fServer->Log()) == loginsBefore + 2; };
     std::function<bool()> const isReadyAgain = isInterruptedAgain ? isCleaningUp : std::function<bool()>();
     std::string const command = "send --clean-up " + std::string(isInterruptedAgain ? "3600 " : "3 ") + fFile + " ";
+    auto const start = std::chrono::steady_clock::now();
     TInterrupted const sent = InterruptedZep(command + fServer->UrlAt(relay.Port(), "f"), fDir, isMoving, SIGINT, isReadyAgain);
+    EXPECT_LT(SecondsSince(start), 110) << "libcurl alone would wait for two minutes";
     EXPECT_EQ(sent.signal, SIGINT);
     EXPECT_THAT(sent.output, testing::ContainsRegex(": interrupted; the server may have a part of it: " + std::string(kPartUrl)));
     for (std::string const& name : NamesIn(fServer->Tree().Path())) fs::remove(Remote(name));

@@ -173,6 +173,16 @@ std::string WhyNotReadable(std::string const& file, struct stat& status) {
   return opened && ::pread(opened.get(), &first, 1, 0) >= 0 ? "" : ReasonOf(errno);
 }
 
+// Computes the checksum, which stays empty after an interrupt. Returns why it cannot, or an empty text.
+std::string WhyNoChecksum(std::string const& file, std::string& checksum) {
+  try {
+    checksum = Sha256Of(file);
+    return "";
+  } catch (std::exception const& failure) {
+    return Printable(failure.what());
+  }
+}
+
 bool IsAsBefore(std::string const& file, struct stat const& before) {
   struct stat now;
   return ::stat(file.c_str(), &now) == 0 && IsSameFile(now, before) && now.st_size == before.st_size &&
@@ -381,9 +391,10 @@ bool IsAsWritten(std::string const& part, TTransferState const& state) {
 TTransferred Completed(TTransferred transferred, std::string const& file, bool overwrites, TTransferState const& state) {
   std::string const& part = transferred.fFile;
   transferred.fBytes = state.fMoved;
-  if (IsAsWritten(part, state)) transferred.fSha256 = Sha256Of(part);
+  std::string const whyNoChecksum = IsAsWritten(part, state) ? WhyNoChecksum(part, transferred.fSha256) : "";
   if (!IsAsWritten(part, state))
     return Decided(Failed(transferred, kExitNotWritten, "another program changed or removed this file during the download"));
+  if (!whyNoChecksum.empty()) return Decided(Failed(transferred, kExitNotWritten, whyNoChecksum + PartText(part)));
   if (IsInterruptedAtLast()) {
     MarkForResuming(part, state);
     return Failed(transferred, StatusOfInterrupt(), "interrupted" + PartText(part));
@@ -472,9 +483,11 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
   ExplainUpload(transferred, place, names, *state);
   if (exit != kExitComplete) return Decided(transferred);
   bool const isAsBefore = IsAsBefore(file, before);
-  if (isAsBefore) transferred.fSha256 = Sha256Of(file);
+  std::string const whyNoChecksum = isAsBefore ? WhyNoChecksum(file, transferred.fSha256) : "";
   if (!isAsBefore || !IsAsBefore(file, before))
     return Decided(Failed(transferred, kExitPartial, "the file changed while it was sent"));
+  if (!whyNoChecksum.empty())
+    return Decided(Failed(transferred, kExitPartial, "it was sent, but its checksum is not known: " + whyNoChecksum));
   return Decided(transferred);
 }
 

@@ -3,9 +3,11 @@
 
 #include "core/Handles.h"
 #include "tools/zep/processes/Interrupts.h"
+#include "tools/zep/processes/TChildProcess.h"
 
 #include <netdb.h>
 #include <poll.h>
+#include <signal.h>
 #include <sys/socket.h>
 
 #include <algorithm>
@@ -36,20 +38,18 @@ int Resolve(std::string const& host, std::string const& port, TAddresses& addres
   return error;
 }
 
-// Waits until connecting has ended. Returns 0, ETIMEDOUT, or EINTR after an interrupt (Interrupts.h); other signals do not
-// shorten the wait.
+// Waits until connecting has ended. Returns 0 or ETIMEDOUT. No signal shortens the wait.
 int WaitForConnection(int socket, int timeoutSeconds) {
   using TClock = std::chrono::steady_clock;
   TClock::time_point const end = TClock::now() + std::chrono::seconds(timeoutSeconds);
   pollfd waiting{socket, POLLOUT, 0};
-  while (PendingInterrupt() == 0) {
+  while (true) {
     auto const left = std::chrono::ceil<std::chrono::milliseconds>(end - TClock::now()).count();
     int const ready = ::poll(&waiting, 1, static_cast<int>(std::max<std::int64_t>(left, 0)));
     if (ready > 0) return 0;
     if (ready == 0) return ETIMEDOUT;
     if (errno != EINTR) return errno;
   }
-  return EINTR;
 }
 
 // The errno of connecting; 0 when it succeeds.
@@ -65,7 +65,6 @@ int ErrorOfConnecting(addrinfo const& address, int timeoutSeconds) {
 }
 
 std::string ReasonOf(int error, std::string const& host, std::string const& port) {
-  if (error == EINTR) return "interrupted";
   if (error == ECONNREFUSED)
     return host + " refuses connections to port " + port + "; is the server running, and the port right?";
   if (error == ETIMEDOUT)
@@ -73,9 +72,7 @@ std::string ReasonOf(int error, std::string const& host, std::string const& port
   return host + ", port " + port + ": " + std::generic_category().message(error);
 }
 
-}  // namespace
-
-std::string WhyUnreachable(std::string const& host, std::string const& port, int timeoutSeconds) {
+std::string ResultOfProbe(std::string const& host, std::string const& port, int timeoutSeconds) {
   TAddresses addresses(nullptr, ::freeaddrinfo);
   int const unknown = Resolve(host, port, addresses);
   if (unknown == EAI_AGAIN) return "the host name " + host + " could not be looked up: no name server answers";
@@ -84,9 +81,21 @@ std::string WhyUnreachable(std::string const& host, std::string const& port, int
   for (addrinfo const* address = addresses.get(); address != nullptr; address = address->ai_next) {
     error = ErrorOfConnecting(*address, timeoutSeconds);
     if (error == 0) return "";
-    if (error == EINTR) break;
   }
   return ReasonOf(error, host, port);
+}
+
+}  // namespace
+
+// In a process of its own, which an interrupt ends: the look-up of a name goes on after a signal.
+std::string WhyUnreachable(std::string const& host, std::string const& port, int timeoutSeconds) {
+  constexpr int kLookEveryMilliseconds = 100;
+  TChildProcess child([&] { return ResultOfProbe(host, port, timeoutSeconds); }, SIGKILL);
+  std::string why;
+  pollfd waiting{child.Output(), POLLIN, 0};
+  while (PendingInterrupt() == 0)
+    if (::poll(&waiting, 1, kLookEveryMilliseconds) > 0 && !child.Read(why)) return why;
+  return "interrupted";
 }
 
 }  // namespace NQRVZEP20::zep

@@ -2,16 +2,22 @@
 #include "tools/zep/transfer/Unreachable.h"
 
 #include "core/Handles.h"
+#include "tests/Support.h"
 #include "tools/zep/processes/Interrupts.h"
 
 #include <arpa/inet.h>
 #include <gmock/gmock.h>
 #include <netinet/in.h>
+#include <sched.h>
 #include <signal.h>
+#include <sys/mount.h>
 #include <sys/socket.h>
 #include <sys/time.h>
 
+#include <unistd.h>
+
 #include <chrono>
+#include <cstdlib>
 #include <iostream>
 
 namespace NQRVZEP20::zep {
@@ -100,6 +106,38 @@ TEST(UnreachableTest, AnInterruptEndsTheWaitAndIsTheReason) {
         std::cerr << WhyUnreachable("127.0.0.1", port.Number(), 600);
       },
       testing::KilledBySignal(SIGTERM), "^interrupted$");
+}
+
+// For use in a child: in a network of its own, in which the only name server does not answer. False when that is not possible.
+bool HaveSilentNameServer(TTempDir const& dir, int socket) {
+  WriteFile(dir.Path("resolv.conf"), "nameserver 127.0.0.1\noptions timeout:30 attempts:5\n");
+  WriteFile(dir.Path("nsswitch.conf"), "hosts: dns\n");
+  if (::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) != 0) return false;
+  for (char const* const name : {"resolv.conf", "nsswitch.conf"})
+    if (::mount(dir.Path(name).c_str(), (std::string("/etc/") + name).c_str(), nullptr, MS_BIND, nullptr) != 0) return false;
+  sockaddr_in name{};
+  name.sin_family = AF_INET;
+  name.sin_port = htons(53);
+  name.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+  return std::system("ip link set lo up") == 0 && ::bind(socket, reinterpret_cast<sockaddr*>(&name), sizeof name) == 0;
+}
+
+TEST(UnreachableTest, AnInterruptEndsTheLookUpOfAName) {
+  NEEDS(::geteuid() == 0 && std::system("command -v ip > /dev/null") == 0, "root, and ip (package iproute2)");
+  TTempDir const dir;
+  EXPECT_EXIT(
+      {
+        if (::unshare(CLONE_NEWNET | CLONE_NEWNS) != 0) ::_exit(1);
+        TUniqueFd const server(::socket(AF_INET, SOCK_DGRAM, 0));
+        if (!HaveSilentNameServer(dir, server.get())) ::_exit(2);
+        TInterruptGuard const guard;
+        Repeat([](int) { ::raise(SIGTERM); });
+        auto const start = std::chrono::steady_clock::now();
+        std::string const why = WhyUnreachable("host.example", "21", 3);
+        bool const isSoon = std::chrono::steady_clock::now() - start < std::chrono::seconds(60);
+        std::cerr << why << (isSoon ? " soon" : " late");
+      },
+      testing::KilledBySignal(SIGTERM), "^interrupted soon$");
 }
 
 }  // namespace
