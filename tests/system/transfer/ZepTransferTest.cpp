@@ -836,6 +836,20 @@ TEST_F(ZepHiddenDirectoryTest, OverSftpADirectoryThatCannotBeListedIsNotReplaced
   ExpectDirectoryAlone("incoming", "uploads");
 }
 
+// The name of another file reads like a line of the listing that shows a regular file.
+TEST_F(ZepHiddenDirectoryTest, OverSftpAForgedListingDoesNotReplaceADirectory) {
+  ASSERT_NO_FATAL_FAILURE(Start("sftp"));
+  if (IsSkipped()) return;
+  std::string const d = fServer->Tree().Path("d"), line = "\n-rw-r--r--    1 0        0               4 Jan  1 00:00 uploads";
+  fs::create_directory(d);
+  for (int n = 0; n < 30; ++n) WriteFile(d + "/" + std::to_string(n) + line, "");  // any of them may be listed first
+  MakeDirectory("d/uploads", 0, 0755);
+  TProgramRun const run = Send("", fServer->Url("d/uploads"));
+  EXPECT_EQ(run.exitCode, kNothing);
+  EXPECT_THAT(run.output, EndsWith(": uploads is a directory; end the URL with \"/\"\n"));
+  EXPECT_EQ(ReadFile(d + "/uploads/a"), "precious");
+}
+
 TEST_F(ZepHiddenDirectoryTest, OverSftpAFileInADirectoryThatCannotBeListedIsReplaced) {
   ASSERT_NO_FATAL_FAILURE(Start("sftp"));
   if (IsSkipped()) return;

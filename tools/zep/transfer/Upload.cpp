@@ -270,7 +270,11 @@ private:
     return {TAtPlace::kUnknown, -1, isAnswered ? CURLE_OK : sized};
   }
 
+  // A name with a line feed can forge a line of the listing. Therefore a directory is looked for first.
   TAtPlace LookBySftp() {
+    CURLcode const entered = Enter();
+    if (entered == CURLE_OK) return {TAtPlace::kDirectory};
+    if (!IsRefusal(entered)) return {TAtPlace::kUnknown, -1, entered};
     std::string listing;
     CURLcode const listed = List(listing);
     bool const isTooLong = listed == CURLE_WRITE_ERROR;
@@ -284,9 +288,6 @@ private:
 
   // Of SFTP: for a link, which is replaced when it leads to a file or nowhere, and for an entry that the server does not list.
   TAtPlace LookByOpening(bool isLink) {
-    CURLcode const entered = Enter();
-    if (entered == CURLE_OK) return {TAtPlace::kDirectory};
-    if (!IsRefusal(entered)) return {TAtPlace::kUnknown, -1, entered};
     Prepare(true, {});
     fConnection.Set(CURLOPT_WRITEFUNCTION, &EndTransfer);
     CURLcode const read = fConnection.Perform(fNames.Url());
