@@ -11,7 +11,7 @@
 
 namespace NQRVZEP20 {
 
-// One provider that a plug-in registered, after it was asked to fill its namespace.
+// One provider that a plug-in registered, after the call that fills its namespace.
 struct TProviderRun {
   std::string fName;
   std::shared_ptr<TNamespaceView const> fView;  // null when the provider failed

@@ -73,7 +73,7 @@ TReportAnswer AnswerTo(TQuestion const& question, TNamespaceView const& view) {
   auto const instances = view.InstancesOf(question.fClassName);
   if (instances.empty()) return StillUnknown(view.AnswerWithoutInstance(question.fClassName, question.fProperty));
   if (instances.size() > 1)
-    return Unknown(kMissingUnexpected, "the provider describes " + std::to_string(instances.size()) + " of them", "");
+    return Unknown(kMissingUnexpected, "the provider describes " + std::to_string(instances.size()) + " instances", "");
 
   TValueAnswer const raw = view.Answer(*instances.front(), question.fProperty);
   if (!raw.IsKnown()) return StillUnknown(raw);
@@ -217,7 +217,7 @@ constexpr TDetail kDetails[] = {
 // ---- All providers ----
 
 TReportAnswer WithoutProvider(std::vector<TPlugIn> const& plugIns) {
-  return Unknown(kMissingNotDescribed, plugIns.empty() ? "no provider plug-in found" : "no provider plug-in works", "");
+  return Unknown(kMissingNotDescribed, plugIns.empty() ? "no provider plug-in found" : "no provider plug-in could be used", "");
 }
 
 template <class TQuery>

@@ -102,13 +102,13 @@ TMissing TNamespaceView::WhyMissing(ICIMInstance const& instance, std::string co
 }
 
 TMissing TNamespaceView::WhyNoInstance(std::string const& className) const {
-  return fReasons.WhyNoInstance(className).value_or(TMissing{kMissingNotDescribed, "the provider describes none"});
+  return fReasons.WhyNoInstance(className).value_or(TMissing{kMissingNotDescribed, "the provider describes no instances"});
 }
 
 TAnswer<TCIMValue> TNamespaceView::Answer(ICIMInstance const& instance, std::string const& name) const {
   using TValueAnswer = TAnswer<TCIMValue>;
   auto const property = instance.GetProperty(name, TCIMContext());
-  if (!property) return TValueAnswer::Unknown({kMissingNotGiven, "the provider knows no property " + name}, "");
+  if (!property) return TValueAnswer::Unknown({kMissingNotGiven, "the provider has no property " + name}, "");
   std::string const source = SourceOf(*property->GetDeclaration(TCIMContext()));
   TCIMValue const value = property->GetValue(TCIMContext());
   if (value.IsNull()) return TValueAnswer::Unknown(WhyMissing(instance, name), source);

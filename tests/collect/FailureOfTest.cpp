@@ -19,7 +19,7 @@ TEST(FailureOfTest, NamesWhatWasThrown) {
   EXPECT_EQ(FailureOf([] { throw TZEPException(kZEPStatusAccessDenied); }), "kZEPStatusAccessDenied");
 }
 
-TEST(FailureOfTest, HoldsBackObjectsThatAreNotExceptions) {
+TEST(FailureOfTest, ObjectsThatAreNotExceptionsAreCaught) {
   EXPECT_EQ(FailureOf([] { throw 5; }), "it threw something that is not a std::exception");
 }
 

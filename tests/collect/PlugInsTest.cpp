@@ -71,7 +71,7 @@ protected:
   TTempDir const fDir;
 };
 
-TEST_F(PlugInDirectoryTest, APlugInThatFailsStopsNoOther) {
+TEST_F(PlugInDirectoryTest, APlugInThatFailsDoesNotStopTheOthers) {
   std::string const broken = "plug-in Broken: " + fDir.Path("libBroken.nsp.so") + ": file too short (open, libBroken.nsp.so)\n";
   struct TRow {
     char const *fBehaviour, *fListed;

@@ -71,14 +71,14 @@ TEST_F(TNamespaceViewTest, WithoutAReasonTheReasonIsGeneral) {
   auto const note = fNamespace->AddInstance("X_Note", {});
   for (TRow const& row : {TRow{view.AnswerOfFirst("X_None", "Text"), "not-described", "no provider describes it"},
                           TRow{view.Answer(*note, "Text"), "not-given", "the provider gives no value"},
-                          TRow{view.Answer(*note, "Colour"), "not-given", "the provider knows no property Colour"}}) {
+                          TRow{view.Answer(*note, "Colour"), "not-given", "the provider has no property Colour"}}) {
     EXPECT_FALSE(row.fAnswer.IsKnown());
     EXPECT_EQ(row.fAnswer.fMissing.fCode, row.fCode);
     EXPECT_EQ(row.fAnswer.fMissing.fReason, row.fReason);
   }
 }
 
-TEST_F(TNamespaceViewTest, SourcesBearTheLabelOfTheSample) {
+TEST_F(TNamespaceViewTest, SourcesHaveTheLabelOfTheSample) {
   EXPECT_EQ(View().AnswerOfFirst("X_Disk", "Bytes").fSource, "sysfs (file)");
   EXPECT_EQ(View("SAMPLE").AnswerOfFirst("X_Disk", "Bytes").fSource, "SAMPLE, sysfs");
   EXPECT_EQ(View("SAMPLE").GetSampleLabel(), "SAMPLE");

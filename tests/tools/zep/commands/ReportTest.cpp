@@ -530,7 +530,7 @@ TEST_F(ReportTest, ABrokenPlugInAloneReportsNothing) {
   WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
   TRun const run = Report(RealTablePath("full"));
   EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(LinesOf(run.output)[0], "Unnamed machine: not identified: no provider plug-in works");
+  EXPECT_EQ(LinesOf(run.output)[0], "Unnamed machine: not identified: no provider plug-in could be used");
 }
 
 TEST_F(ReportTest, AProviderThatFailsIsReportedAndStopsNoOther) {
@@ -630,7 +630,7 @@ TEST_F(ReportTest, TwoSystemsAreNotOneIdentity) {
   fZep.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("two-systems");
   EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: the provider describes 2 of them");
+  EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: the provider describes 2 instances");
 }
 
 // ---- Foreign bytes ----
