@@ -118,7 +118,7 @@ private:
     cls->EnumeratePropertyDecls(
         [&](boost::shared_ptr<ICIMPropertyDecl> const& decl) {
           fDeclNumbers[decl.get()] = {number, decls.size()};
-          decls.push_back(decl);
+          decls.emplace_back(decl);
           return true;
         },
         kNone);

@@ -45,7 +45,8 @@ void WriteWhole(std::string_view bytes) {
   while (!bytes.empty()) {
     ssize_t const count = ::write(gAnswer, bytes.data(), bytes.size());
     if (count < 0 && errno == EINTR) continue;
-    while (count < 0) ::pause();
+    if (count < 0)
+      for (;;) ::pause();
     bytes.remove_prefix(static_cast<std::size_t>(count));
   }
 }

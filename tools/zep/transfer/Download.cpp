@@ -143,9 +143,9 @@ private:
 
 }  // namespace
 
-TZEPStatusCode Download(TRemote const& remote, std::string const& file, bool isThere, std::uint64_t mostBytes,
+TZEPStatusCode Download(TRemote const& remote, std::string const& part, bool isThere, std::uint64_t mostBytes,
                         TTransferState& state) {
-  TDownload(remote, file, isThere, mostBytes, state).Run();
+  TDownload(remote, part, isThere, mostBytes, state).Run();
   return kZEPStatusOK;
 }
 
