@@ -24,7 +24,7 @@ namespace {
 constexpr std::size_t kMostWords = 4096;             // kept of either end
 constexpr std::size_t kMostLog = 16u * 1024 * 1024;  // the last line is kept of a longer log, too
 constexpr std::size_t kMostProviders = 10'000;
-constexpr std::chrono::seconds kGrace(1);       // for a process whose pipe is closed to end by itself
+constexpr std::chrono::seconds kGrace(5);       // for a process whose pipe is closed to end by itself
 constexpr std::chrono::seconds kTimeToEnd(10);  // for a supervisor to end everything
 
 // Reads what has arrived, up to a mebibyte, and passes it on. Closes the descriptor at the end of the pipe.
@@ -113,12 +113,16 @@ void TPlugInProcess::ReadAnswer() {
   ReadFrom(fAnswer, [&](std::string_view bytes) {
     if (fEnding != EEnding::kNone) return;  // dropped
     fMessages.Add(bytes);
-    while (auto const message = fMessages.Next()) Take(*message);
+    while (fEnding == EEnding::kNone) {
+      auto const message = fMessages.Next();
+      if (!message) break;
+      Take(*message);
+    }
     if (!fMessages.IsBad()) return;
     fWhyBad = "a message has a wrong form";
     End(EEnding::kBadAnswer);
   });
-  if (!fAnswer && !fIsDone && !fGiveUpAt) fGiveUpAt = TClock::now() + kGrace;
+  if (!fAnswer && !fGiveUpAt) fGiveUpAt = TClock::now() + kGrace;
 }
 
 void TPlugInProcess::ReadWords() {
@@ -153,6 +157,7 @@ void TPlugInProcess::Take(TMessage const& message) {
                                     NameOf(EStage::kRegistration), ""});
       return;
     case EMessage::kLoaded:
+      if (fHasLoaded) return;
       fResult.fMilliseconds = std::strtod(message.fText.c_str(), nullptr);
       fHasLoaded = true;
       fDeadline = TClock::now() + std::chrono::seconds(fLimits.fTimeoutSeconds);  // of the fill
@@ -176,8 +181,7 @@ void TPlugInProcess::Take(TMessage const& message) {
       fExitStatus = message.fText;
       return;
     case EMessage::kDone:
-      fIsDone = true;
-      return;
+      return End(EEnding::kDone);
   }
 }
 
@@ -194,8 +198,10 @@ void TPlugInProcess::TakeNamespace(std::string const& milliseconds) {
   fProvider.reset();
 }
 
-// The lines that were logged before the failure have arrived.
+// The failure of the provider that is filling its namespace, or else of the plug-in, of which the first one counts. The lines
+// that were logged before the failure have arrived.
 void TPlugInProcess::TakeFailure(std::string why) {
+  if (!fProvider && !fResult.fError.empty()) return;
   bool const isOutOfMemory = fLimits.fMemoryMebibytes != 0 && why.find("std::bad_alloc") != why.npos;
   if (isOutOfMemory) why += " (the memory limit is " + std::to_string(fLimits.fMemoryMebibytes) + " MiB)";
   ReadLog();
@@ -242,7 +248,7 @@ void TPlugInProcess::End(EEnding ending) {
 void TPlugInProcess::CheckDeadlines() {
   TClock::time_point const now = TClock::now();
   if (fEnding == EEnding::kNone) {
-    if (!fIsDone && fDeadline && now >= *fDeadline) return End(EEnding::kTimeUp);
+    if (fDeadline && now >= *fDeadline) return End(EEnding::kTimeUp);
     if (fGiveUpAt && now >= *fGiveUpAt) End(EEnding::kClosed);
   } else if (now >= *fGiveUpAt) {  // a process that waits for a device cannot be ended
     ::kill(fSupervisor, SIGKILL);
@@ -254,17 +260,18 @@ void TPlugInProcess::Complete() {
   fAnswer.reset();
   ReadWords();
   ReadLog();
-  if (!fIsDone) RecordDeath();
+  if (fEnding != EEnding::kDone) TakeFailure(WhyDead());
+  RecordUnfilled();
   fResult.fWords = fWords.Get();
   fHasEnded = true;
 }
 
-// The failure is that of the provider that was filling its namespace, or else of the plug-in. The other providers are not asked.
-void TPlugInProcess::RecordDeath() {
-  TakeFailure(WhyDead());
+// Of the providers that came after the one that ended the process, and of those that were registered after the load.
+void TPlugInProcess::RecordUnfilled() {
   for (TProviderRun& run : fResult.fProviders)
     if (!run.fView && run.fError.empty()) {
-      run.fError = "not filled, because the process of the plug-in had ended";
+      run.fError = fEnding == EEnding::kDone ? "not filled, because it was registered after the plug-in had been loaded"
+                                             : "not filled, because the process of the plug-in had ended";
       run.fStage = NameOf(EStage::kFill);
     }
 }

@@ -46,7 +46,7 @@ public:
   double SecondsInStage() const { return std::chrono::duration<double>(TClock::now() - fStageBegan).count(); }
 
 private:
-  enum class EEnding { kNone, kTimeUp, kTooLong, kBadAnswer, kClosed };
+  enum class EEnding { kNone, kDone, kTimeUp, kTooLong, kBadAnswer, kClosed };
 
   void Start(TApartLimits const& limits);
   void ReadAnswer();
@@ -60,7 +60,7 @@ private:
   void End(EEnding ending);  // the first reason counts
   void CheckDeadlines();
   void Complete();
-  void RecordDeath();
+  void RecordUnfilled();
   std::string WhyDead() const;
   TProviderRun& RunOf(std::string const& name);
   TProviderRun* CurrentRun();
@@ -81,7 +81,7 @@ private:
   TClock::time_point fStageBegan = TClock::now();
   std::optional<TClock::time_point> fDeadline;  // of the load or the fill
   std::optional<TClock::time_point> fGiveUpAt;  // when the supervisor or the process is waited for no longer
-  bool fHasLoaded = false, fIsDone = false, fHasEnded = false;
+  bool fHasLoaded = false, fHasEnded = false;
   EEnding fEnding = EEnding::kNone;
   std::string fWhyBad;                     // of kBadAnswer
   std::optional<std::string> fExitStatus;  // that the plug-in passed to exit

@@ -11,6 +11,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <memory>
 
@@ -122,15 +123,15 @@ TEST_F(PlugInsApartMisdeedTest, APlugInThatDiesCostsOnlyItsOwnRow) {
 
 TEST_F(PlugInsApartMisdeedTest, APlugInThatHangsIsEndedWithAllThatItStarted) {
   TLines const expected = {
-      InFill("Hangs", "it exceeded the time limit of 3 s"),
+      InFill("Hangs", "it exceeded the time limit of 6 s"),
       "provider HangsAfter: not filled, because the process of the plug-in had ended (fill, libHangs.nsp.so)",
-      InFill("HangsBlocked", "it exceeded the time limit of 3 s"),
-      InFill("Stops", "it exceeded the time limit of 3 s"),
-      InLoad("LoadHangs", "it exceeded the time limit of 3 s", "static construction"),
-      InLoad("RegistrationHangs", "it exceeded the time limit of 3 s", "registration"),
+      InFill("HangsBlocked", "it exceeded the time limit of 6 s"),
+      InFill("Stops", "it exceeded the time limit of 6 s"),
+      InLoad("LoadHangs", "it exceeded the time limit of 6 s", "static construction"),
+      InLoad("RegistrationHangs", "it exceeded the time limit of 6 s", "registration"),
   };
   Add({"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs"});
-  TLines const lines = List("--timeout 3 --parallel 8");
+  TLines const lines = List("--timeout 6 --parallel 8");
   for (std::string const& line : expected) EXPECT_THAT(lines, Contains(line));
   ExpectNoProcess("Hangs");
   ExpectNoProcess("HangsBlocked");
@@ -169,6 +170,18 @@ TEST_F(PlugInsApartMisdeedTest, AnEndlessAnswerIsCutOff) {
   EXPECT_THAT(lines, Contains("provider AnswersBroken: filled root/own (1)"));
 }
 
+// The end of the answer arrives together with the piece that is too long.
+TEST_F(PlugInsApartMisdeedTest, AnAnswerThatIsSlightlyTooLongIsNotAcceptedInPart) {
+  Add({"Healthy"});
+  int limit = 50;
+  TLines lines = List("--answer 50");
+  for (; std::count(lines.begin(), lines.end(), Filled("Healthy")) == 0; lines = List("--answer " + std::to_string(limit))) {
+    ASSERT_THAT(lines, Contains(InFill("Healthy", "its answer exceeds " + std::to_string(limit) + " bytes")));
+    ASSERT_LT(limit += 20, 5000);
+  }
+  EXPECT_GT(limit, 50);
+}
+
 TEST_F(PlugInsApartMisdeedTest, TheMemoryLimitEndsAPlugInThatFillsMemory) {
   if (kIsSanitized) GTEST_SKIP() << "a sanitizer reserves more address space than any limit";
   Add({"FillsMemory", "Healthy"});
@@ -205,6 +218,14 @@ TEST_F(PlugInsApartMisdeedTest, OfTwoProvidersWithOneNameTheFirstCounts) {
   EXPECT_THAT(lines, Contains("provider RegistersTwice: the plug-in registers this name twice; the first one counts "
                               "(registration, libRegistersTwice.nsp.so)"));
   EXPECT_THAT(lines, Contains("plug-in RegistersNothing: "));
+}
+
+TEST_F(PlugInsApartMisdeedTest, AProviderThatIsRegisteredDuringTheFillIsNotFilled) {
+  Add({"RegistersLate"});
+  TLines const lines = List("");
+  EXPECT_THAT(lines, Contains(Filled("RegistersLate")));
+  EXPECT_THAT(lines, Contains("provider Late: not filled, because it was registered after the plug-in had been loaded (fill, "
+                              "libRegistersLate.nsp.so)"));
 }
 
 TEST_F(PlugInsApartMisdeedTest, WhatAPlugInLogsIsLoggedHere) {

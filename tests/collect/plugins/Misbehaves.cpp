@@ -211,9 +211,12 @@ std::map<std::string, TMisdeed> const kWhileFilling = {
     {"LimitsItself", [] { ::umask(0777), ::setenv("ZEP_HOST_NAME", "wrong", 1); }},
 };
 
+void Register(std::string const& name);
+
 void Fill(TMemoryNamespace& ns) {
   auto const misdeed = kWhileFilling.find(OwnName());
   if (misdeed != kWhileFilling.end()) misdeed->second();
+  if (OwnName() == "RegistersLate") Register("Late");
   ns.DefineClass("X_" + OwnName()).Key("Id", "uint32");
   ns.AddInstance("X_" + OwnName(), {{"Id", 1}});
 }
