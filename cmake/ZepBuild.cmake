@@ -103,5 +103,8 @@ function(zep_test name)
   if(ARG_LOCK)
     list(APPEND properties RESOURCE_LOCK "${ARG_LOCK}")
   endif()
+  if(ZEP_SANITIZE)  # once in some thousand tests the search for leaks itself crashes, after the test has passed
+    list(APPEND properties SKIP_REGULAR_EXPRESSION ".  SKIPPED .|PASSED  . 1 test.*Tracer caught signal")
+  endif()
   gtest_discover_tests(${name} TEST_PREFIX "${name}." DISCOVERY_MODE PRE_TEST DISCOVERY_TIMEOUT 60 PROPERTIES ${properties})
 endfunction()
