@@ -8,6 +8,7 @@
 #include <fcntl.h>
 #include <gmock/gmock.h>
 #include <signal.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -204,8 +205,13 @@ TEST_F(PlugInsApartMisdeedTest, WordsOfAPlugInAreCaught) {
 
 TEST_F(PlugInsApartMisdeedTest, ChangesOfAProcessStayInIt) {
   Add({"ChangesDirectory", "LimitsItself", "Healthy"});
-  TLines const lines = List("--parallel 1");
+  mode_t const mask = ::umask(0);
+  ::umask(mask);
+  TLines const lines = List("--parallel 1 --state");
   for (char const* name : {"ChangesDirectory", "LimitsItself", "Healthy"}) EXPECT_THAT(lines, Contains(Filled(name)));
+  EXPECT_THAT(lines, Contains("directory: " + fs::current_path().string()));
+  EXPECT_THAT(lines, Contains("umask: " + std::to_string(mask)));
+  EXPECT_THAT(lines, Contains("ZEP_HOST_NAME: not set"));
 }
 
 TEST_F(PlugInsApartMisdeedTest, OfTwoProvidersWithOneNameTheFirstCounts) {

@@ -2,14 +2,18 @@
 
 // Loads the plug-ins, and prints a line for each plug-in and each provider: its failure, or the namespace that it filled and its
 // instances. With --apart each plug-in has a process of its own; then these options may follow:
-//   --timeout SECONDS, --memory MEBIBYTES, --answer BYTES, --parallel NUMBER, --log
+//   --timeout SECONDS, --memory MEBIBYTES, --answer BYTES, --parallel NUMBER, --log, --state (prints the state of this process
+// afterwards)
 
 #include "ICIMInstance.h"
 #include "TLogger.h"
 #include "TRootObject.h"
 #include "collect/PlugInsApart.h"
 
+#include <sys/stat.h>
+
 #include <cstdlib>
+#include <filesystem>
 #include <iostream>
 #include <string>
 #include <vector>
@@ -31,6 +35,13 @@ std::vector<TPlugIn> Load(std::vector<std::string> const& words) {
   return LoadPlugInsApart(std::nullopt, options);
 }
 
+void PrintState() {
+  char const* const host = std::getenv("ZEP_HOST_NAME");
+  std::cout << "directory: " << std::filesystem::current_path().string() << "\n";
+  std::cout << "umask: " << ::umask(0) << "\n";
+  std::cout << "ZEP_HOST_NAME: " << (host == nullptr ? "not set" : host) << "\n";
+}
+
 std::string ResultOf(TPlugIn const& plugIn, TProviderRun const& run) {
   if (!run.fView) return FailurePhraseOf(plugIn, run);
   return "filled " + run.fView->GetName() + " (" + std::to_string(run.fView->AllInstances().size()) + ")";
@@ -48,4 +59,5 @@ int main(int argc, char** argv) {
   }
   if (!words.empty() && words.back() == "--log")
     for (ILogger::TLogEntry const& entry : TRootObject::GetCoreLogger()->GetLog()) std::cout << "log: " << entry.fMessage << "\n";
+  if (!words.empty() && words.back() == "--state") PrintState();
 }

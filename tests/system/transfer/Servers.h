@@ -47,8 +47,8 @@ private:
   std::string fNumber;
 };
 
-// A TCP port of loopback at which no connection is refused and none gets an answer, as behind a firewall that drops packets: the
-// only connection that may wait is there already.
+// A TCP port of loopback that neither accepts nor refuses a connection, as with a firewall that drops packets: its queue, which
+// has room for one connection, is full.
 class TSilentPort {
 public:
   TSilentPort()
