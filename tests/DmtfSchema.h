@@ -18,7 +18,7 @@ inline std::string DmtfArchive() {
   namespace fs = std::filesystem;
   std::vector<fs::path> folders;
   if (char const* const named = ::getenv("ZEP_DMTF_SCHEMA")) folders.emplace_back(named);
-  for (fs::path above = fs::path(ZEP_SOURCE_DIR).parent_path(); above != above.parent_path(); above = above.parent_path())
+  for (fs::path above = fs::path(SourcePath()).parent_path(); above != above.parent_path(); above = above.parent_path())
     folders.push_back(above / "shared/data/dmtf-schema");
   for (fs::path const& folder : folders)
     if (fs::exists(folder / kDmtfArchive)) return (folder / kDmtfArchive).string();

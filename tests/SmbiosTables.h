@@ -18,12 +18,12 @@ using namespace std::string_literals;
 // exported.
 inline std::vector<std::string> const kRealTables = {"full", "bare7", "eight", "no-serial", "two-dashes", "qemu-own", "entry64"};
 
-inline std::string RealTablePath(std::string const& name) { return std::string(ZEP_TEST_DATA_DIR) + "/smbios/" + name + "/DMI"; }
+inline std::string RealTablePath(std::string const& name) { return TestDataPath("smbios/" + name + "/DMI"); }
 
 inline std::string RealTable(std::string const& name) { return ReadFile(RealTablePath(name)); }
 
 // The invented server that is bundled with the front end, in the format of `dmidecode --dump-bin`.
-inline std::string SamplePath() { return std::string(ZEP_SOURCE_DIR) + "/tools/zep/sample/smbios.bin"; }
+inline std::string SamplePath() { return SourcePath("tools/zep/sample/smbios.bin"); }
 
 inline std::string LittleEndian(unsigned long long number, int bytes) {
   std::string text;

@@ -48,6 +48,12 @@ TEnvironmentGuard::TEnvironmentGuard(char const* name, char const* value) : fNam
 
 TEnvironmentGuard::~TEnvironmentGuard() { fWasSet ? ::setenv(fName.c_str(), fOld.c_str(), 1) : ::unsetenv(fName.c_str()); }
 
+std::string SourcePath(std::string const& relative) { return relative.empty() ? ZEP_SOURCE_DIR : ZEP_SOURCE_DIR "/" + relative; }
+
+std::string BuildPath(std::string const& relative) { return ZEP_BUILD_DIR "/" + relative; }
+
+std::string TestDataPath(std::string const& relative) { return SourcePath("tests/data/" + relative); }
+
 std::string ReadFile(std::string const& path) {
   std::ifstream file(path, std::ios::binary);
   std::ostringstream text;

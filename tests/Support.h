@@ -8,7 +8,6 @@
 #include "TRootObject.h"
 #include "TZEPException.h"
 #include "TZEPFailure.h"
-#include "TestPaths.h"
 
 #include <gtest/gtest.h>
 #include <stdlib.h>
@@ -90,6 +89,11 @@ private:
   std::string fName, fOld;
   bool fWasSet = false;
 };
+
+// A path in the source tree, in the build tree, and in tests/data; the argument is relative to it.
+std::string SourcePath(std::string const& relative = "");
+std::string BuildPath(std::string const& relative);
+std::string TestDataPath(std::string const& relative);
 
 std::string ReadFile(std::string const& path);
 void WriteFile(std::string const& path, std::string const& text);

@@ -20,7 +20,7 @@ namespace {
 
 TCIMContext const kNone;
 
-std::string SourceFile(std::string const& name) { return ReadFile(std::string(ZEP_SOURCE_DIR) + "/" + name); }
+std::string SourceFile(std::string const& name) { return ReadFile(SourcePath(name)); }
 
 std::string OutputOf(std::string const& command) {
   std::unique_ptr<FILE, int (*)(FILE*)> const pipe(::popen(command.c_str(), "r"), ::pclose);
@@ -106,13 +106,14 @@ TEST(BatteriesTest, AMachineWithoutBatteryHasAReason) {
 // ---- The programs ----
 
 TEST(ReadmeExampleTest, PrintsTheMachineTypeAndModelOfTheSample) {
-  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", ZEP_SOURCE_DIR "/tools/zep/sample/smbios.bin");
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", SourcePath("tools/zep/sample/smbios.bin").c_str());
   EXPECT_EQ(OutputOf(ZEP_README_EXAMPLE), "1234AB7\n");
 }
 
 // The environment in which the documentation runs PrintReport.
 std::string PrintedReport() {
-  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", ZEP_SOURCE_DIR "/tools/zep/sample/smbios.bin"), name("ZEP_HOST_NAME", "db1");
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", SourcePath("tools/zep/sample/smbios.bin").c_str()),
+      name("ZEP_HOST_NAME", "db1");
   return OutputOf(ZEP_PRINT_REPORT "; echo $?");
 }
 
@@ -208,7 +209,7 @@ TEST(DocumentationTest, TourShowsTheCodeOfTheExampleAndWhatItPrints) {
   ExpectBlocksFrom("docs/tour.md", "cpp", "examples/Tour.cpp", 9);
   std::string const command = "$ ZEP_SMBIOS_TABLE=tools/zep/sample/smbios.bin build/release/examples/Tour\n";
   TTempDir const dir;  // for its log
-  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", ZEP_SOURCE_DIR "/tools/zep/sample/smbios.bin");
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", SourcePath("tools/zep/sample/smbios.bin").c_str());
   EXPECT_EQ(FirstBlockOf("docs/tour.md", "console"), command + OutputOf("cd " + dir.Path() + " && " ZEP_TOUR));
   EXPECT_NE(ReadFile(dir.Path("tour.log")).find(" the fan turns slowly\n"), std::string::npos);
 }

@@ -46,7 +46,7 @@ TRoom const kRooms[] = {
       "collect"}},
 };
 
-fs::path const kSource = ZEP_SOURCE_DIR;
+fs::path const kSource = SourcePath();
 
 std::vector<fs::path> SourcesOf(std::string const& folder) {
   std::vector<fs::path> sources;

@@ -24,7 +24,7 @@ protected:
   TProgramRun Run(std::string const& function) {
     for (char const* program : {"sed", "dirname", "grep"})
       fs::create_symlink(std::string("/usr/bin/") + program, fDir.Path(program));
-    return RunProgram("PATH=" + fDir.Path() + " /bin/bash -c 'set -euo pipefail; source " ZEP_SOURCE_DIR "/scripts/lib.sh; " +
+    return RunProgram("PATH=" + fDir.Path() + " /bin/bash -c 'set -euo pipefail; source " + SourcePath("scripts/lib.sh") + "; " +
                       function + "' 2>&1");
   }
 

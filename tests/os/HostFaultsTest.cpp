@@ -35,7 +35,7 @@ TOutcome Do(std::string const& operation, std::string const& fault = "") {
     fs::permissions(dir.Path(command), fs::perms::all);
   }
 
-  std::string const program = ZEP_BUILD_DIR "/tests/programs/FaultyOperation " + operation;
+  std::string const program = BuildPath("tests/programs/FaultyOperation") + " " + operation;
   TProgramRun const run = RunProgram("cd " + dir.Path() + " && PATH=" + dir.Path("bin") + ":$PATH ZEP_FAULT=" + fault +
                                      " LD_PRELOAD=" ZEP_FAULTS " timeout 30 " + program + " < /dev/null 2> /dev/null");
   TOutcome outcome{{}, {}, false};

@@ -10,7 +10,7 @@ namespace {
 
 using TLines = std::vector<std::string>;
 
-std::string Sample(std::string const& name) { return ReadFile(std::string(ZEP_TEST_DATA_DIR "/hwinfo/") + name); }
+std::string Sample(std::string const& name) { return ReadFile(TestDataPath("hwinfo/" + name)); }
 
 // ---- DeviceFilesIn ----
 

@@ -201,7 +201,7 @@ TEST_F(TLoggerTest, ALogEntryAfterTheEndOfTheLoggerGetsANewOneWithoutAFile) {
 }
 
 TEST_F(TLoggerTest, ObjectsMayLogAtTheEndOfTheProcess) {
-  TProgramRun const run = RunProgram(ZEP_BUILD_DIR "/tests/programs/LogAtTheEnd " + Path("a.log"));
+  TProgramRun const run = RunProgram(BuildPath("tests/programs/LogAtTheEnd") + " " + Path("a.log"));
   EXPECT_EQ(run.output, "a thread-local object\na static object\na registered provider\n");
   EXPECT_EQ(run.exitCode, 0);
   EXPECT_THAT(ReadFile(Path("a.log")),

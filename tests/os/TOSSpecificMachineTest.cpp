@@ -359,7 +359,7 @@ class SmbiosStandInTest : public testing::Test {
 protected:
   // Runs the operation in a process whose loader searches `libraryDir` first and then `coreDir`.
   TProbeRun Run(std::string const& operation, std::string const& environment = "",
-                std::string const& libraryDir = ZEP_STANDIN_DIR "/whole", std::string const& coreDir = ZEP_BUILD_DIR "/lib") {
+                std::string const& libraryDir = ZEP_STANDIN_DIR "/whole", std::string const& coreDir = BuildPath("lib")) {
     std::string const record = fDir.Path("record");
     WriteFile(record, "");
     std::istringstream output(OutputOfCommand("LD_LIBRARY_PATH=" + libraryDir + ":" + coreDir + " STANDIN_RECORD=" + record +
@@ -534,7 +534,7 @@ TEST_F(SmbiosStandInTest, AFileThatIsNotALibraryCannotBeOpened) {
 }
 
 TEST_F(SmbiosStandInTest, WithoutThePlatformLibraryTheDefaultsAreGiven) {
-  std::filesystem::copy(ZEP_BUILD_DIR "/lib/libzepcore.so", fDir.Path("libzepcore.so"));
+  std::filesystem::copy(BuildPath("lib/libzepcore.so"), fDir.Path("libzepcore.so"));
   for (auto const& [operation, result] :
        {std::pair("GetMachineType", "0000"), std::pair("GetMachineTypeFromID", "0000"), std::pair("GetBiosID", "00"),
         std::pair("type", "0000"), std::pair("name", "Unknown"), std::pair("model", "Unknown"), std::pair("SN", "Unknown"),

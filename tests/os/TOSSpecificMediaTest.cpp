@@ -189,7 +189,7 @@ TEST_F(StandInTest, ErrorMessagesOfTheCommandsAreSuppressed) {
 
 // ---- getxBMCVirtualDevices ----
 
-std::string PathOfSample(std::string const& name) { return ZEP_TEST_DATA_DIR "/hwinfo/" + name; }
+std::string PathOfSample(std::string const& name) { return TestDataPath("hwinfo/" + name); }
 
 TLines VirtualDevices(int kind, bool keepWhole) {
   TLines devices;

@@ -17,9 +17,9 @@ using testing::ElementsAre;
 using testing::IsEmpty;
 using testing::UnorderedElementsAre;
 
-std::string const kLibrary = ZEP_BUILD_DIR "/lib/libzepcore.so";
-std::string const kPlugins = ZEP_BUILD_DIR "/tests/plugins/";
-std::string const kProbe = ZEP_BUILD_DIR "/tests/programs/PluginProbe";
+std::string const kLibrary = BuildPath("lib/libzepcore.so");
+std::string const kPlugins = BuildPath("tests/plugins/");
+std::string const kProbe = BuildPath("tests/programs/PluginProbe");
 
 std::vector<std::string> LinesOf(std::string const& text) {
   std::vector<std::string> lines;
@@ -198,7 +198,7 @@ protected:
 };
 
 TEST_F(RootPathTest, IsTheDirectoryOfTheCoreLibrary) {
-  EXPECT_EQ(TOSSpecific::GetZEPRootPath(), ZEP_BUILD_DIR "/lib");
+  EXPECT_EQ(TOSSpecific::GetZEPRootPath(), BuildPath("lib"));
   EXPECT_THAT(Probe("root"), ElementsAre(fDir.Path()));
 }
 

@@ -685,7 +685,7 @@ TEST_F(SpawnProcessTest, WorksInManyThreads) {
 class SpawnAThousandTimesTest : public testing::TestWithParam<char const*> {};
 
 TEST_P(SpawnAThousandTimesTest, LeaksNothing) {
-  TProgramRun const run = RunProgram(std::string(ZEP_BUILD_DIR "/tests/programs/SpawnsAThousandTimes ") + GetParam());
+  TProgramRun const run = RunProgram(BuildPath("tests/programs/SpawnsAThousandTimes") + " " + GetParam());
   EXPECT_EQ(run.exitCode, 0);  // also without a report of a leak sanitizer
   EXPECT_EQ(run.output, "0 descriptors, no children, 0 bytes\n");
 }

@@ -15,7 +15,7 @@ using TBytes = std::vector<unsigned char>;
 
 // A recorded reply of a DHCP server, read from a file of hexadecimal text.
 inline TBytes RecordedReply(std::string const& name) {
-  std::string digits = ReadFile(ZEP_TEST_DATA_DIR "/wpad/" + name);
+  std::string digits = ReadFile(TestDataPath("wpad/" + name));
   digits.erase(std::remove(digits.begin(), digits.end(), '\n'), digits.end());
   TBytes bytes;
   for (std::size_t at = 0; at + 1 < digits.size(); at += 2)

@@ -35,7 +35,7 @@ TDocumented const& Documented() {
   static TDocumented const documented = [] {
     static std::regex const operation(R"(`(\w+)`(\*?))");
     TDocumented read;
-    std::istringstream lines(ReadFile(ZEP_SOURCE_DIR "/docs/writing-a-provider.md"));
+    std::istringstream lines(ReadFile(SourcePath("docs/writing-a-provider.md")));
     for (std::string line; std::getline(lines, line);) {
       if (line.rfind("| `ICIM", 0) != 0) continue;
       std::vector<std::string> const cells = CellsOf(line);

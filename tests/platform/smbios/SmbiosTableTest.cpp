@@ -250,7 +250,7 @@ TEST(SmbiosTableTest, AnInvalidEntryPointHasNoTable) {
 TEST(SmbiosTableTest, RealEntryPointsAreValidExceptForTheirAddress) {
   for (std::string const& name : kRealTables) {
     SCOPED_TRACE(name);
-    std::string entry = ReadFile(std::string(ZEP_TEST_DATA_DIR) + "/smbios/" + name + "/smbios_entry_point");
+    std::string entry = ReadFile(TestDataPath("smbios/" + name + "/smbios_entry_point"));
     std::string const table = RealTable(name);
     bool const is64 = entry.size() == 24;
     entry.resize(32);

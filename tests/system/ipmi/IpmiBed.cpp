@@ -202,7 +202,7 @@ std::string WithoutVersion2(std::string answer) {
 // ---- The platform library ----
 
 TIpmiClientLibrary::TIpmiClientLibrary() {
-  void* const library = ::dlopen(ZEP_BUILD_DIR "/lib/libipmiClient.so", RTLD_NOW);
+  void* const library = ::dlopen(BuildPath("lib/libipmiClient.so").c_str(), RTLD_NOW);
   if (library == nullptr) throw std::runtime_error(::dlerror());
   fOpen = FunctionOf<decltype(OpenConnection)>(library, "OpenConnection");
   fSend = FunctionOf<decltype(SendIpmiCommand)>(library, "SendIpmiCommand");

@@ -33,7 +33,7 @@ protected:
   void SetUp() override {
     NEEDS(CanMakeNetworks(), "ip (package iproute2), and root");
     EnterNetworkNamespace();
-    fLibrary.reset(::dlopen(ZEP_BUILD_DIR "/lib/ovdusblan.so", RTLD_LAZY));
+    fLibrary.reset(::dlopen(BuildPath("lib/ovdusblan.so").c_str(), RTLD_LAZY));
     ASSERT_TRUE(fLibrary) << ::dlerror();
     fNodes = FunctionOf<decltype(GetNodes)>(fLibrary.get(), "GetNodes");
     fQuery = FunctionOf<decltype(QueryOvdLanState)>(fLibrary.get(), "QueryOvdLanState");
@@ -127,7 +127,7 @@ protected:
     NEEDS(HasIpmiBed(), kIpmiBedNeeds);
     UsbLanTest::SetUp();
     if (HasFatalFailure() || IsSkipped()) return;
-    std::filesystem::current_path(ZEP_BUILD_DIR "/lib");  // the directory with ovdusblan.so
+    std::filesystem::current_path(BuildPath("lib"));  // the directory with ovdusblan.so
   }
 
   static std::string SerialNumberBehindTheSession() { return TIpmiClientLibrary().ReadFru(0x1CC, 7).fData; }

@@ -22,8 +22,8 @@ using testing::HasSubstr;
 using testing::Not;
 using testing::StartsWith;
 
-std::string const kHere = ZEP_SOURCE_DIR "/tests/system/media/";
-std::string const kVm = ZEP_SOURCE_DIR "/tests/system/vm/";
+std::string const kHere = SourcePath("tests/system/media/");
+std::string const kVm = SourcePath("tests/system/vm/");
 
 class MediaVmTest : public testing::Test {
 protected:
@@ -68,9 +68,9 @@ private:
       std::string const path = RunProgram(std::string("PATH=$PATH:/usr/sbin:/sbin; command -v ") + program).output;
       files += " --file " + path.substr(0, path.find('\n'));
     }
-    for (std::string const& file : {kHere + "in-vm.sh", std::string(ZEP_MEDIA_PROBE), std::string(ZEP_PROGRAM),
-                                    std::string(ZEP_PULLS_OUT), std::string(ZEP_BUILD_DIR "/lib/libHost.nsp.so"),
-                                    std::string(ZEP_BUILD_DIR "/lib/libsmbios.so"), std::string(ZEP_BUILD_DIR "/share/zepcore")})
+    for (std::string const& file :
+         {kHere + "in-vm.sh", std::string(ZEP_MEDIA_PROBE), std::string(ZEP_PROGRAM), std::string(ZEP_PULLS_OUT),
+          BuildPath("lib/libHost.nsp.so"), BuildPath("lib/libsmbios.so"), BuildPath("share/zepcore")})
       files += " --file " + file;
     return files;
   }

@@ -115,7 +115,7 @@ private:
     ::prctl(PR_SET_PDEATHSIG, SIGTERM);  // a test that dies takes its servers with it
     ::dup2(output, STDOUT_FILENO);
     for (auto const& [name, value] : environment) ::setenv(name.c_str(), value.c_str(), 1);
-    std::string const path = ZEP_SOURCE_DIR "/tests/system/transfer/servers/" + script;
+    std::string const path = SourcePath("tests/system/transfer/servers/" + script);
     std::vector<char*> texts = {const_cast<char*>(path.c_str())};
     for (std::string const& argument : arguments) texts.push_back(const_cast<char*>(argument.c_str()));
     texts.push_back(nullptr);

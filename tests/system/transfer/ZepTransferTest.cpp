@@ -40,7 +40,7 @@ enum {
   kStalled = 75
 };
 
-std::string const kZep = ZEP_BUILD_DIR "/bin/zep ";
+std::string const kZep = BuildPath("bin/zep") + " ";
 
 std::string Quoted(std::string const& word) { return "'" + word + "'"; }
 
@@ -1554,7 +1554,7 @@ TTerminalRun ZepOnTerminal(std::vector<std::string> arguments, std::vector<std::
     std::vector<char*> texts;
     for (std::string& argument : arguments) texts.push_back(argument.data());
     texts.push_back(nullptr);
-    ::execv(ZEP_BUILD_DIR "/bin/zep", texts.data());
+    ::execv(BuildPath("bin/zep").c_str(), texts.data());
     ::_exit(127);
   }
   TTerminalRun run{"", -1, 0, false};
@@ -1612,7 +1612,7 @@ TEST_F(ZepTransferTest, AnInterruptAtThePromptRestoresTheTerminal) {
 TEST_F(ZepTransferTest, AnInterruptEndsADownloadWhoseTerminalIsStopped) {
   WriteFile(Remote("big"), std::string(3000000, 'x'));
   TServer const relay("relay.py", {"--ftp", "--how", "stall", "0", fServer->Port(), "100000"});
-  std::string const file = fDir.Path("f"), url = fServer->UrlAt(relay.Port(), "big"), program = ZEP_BUILD_DIR "/bin/zep";
+  std::string const file = fDir.Path("f"), url = fServer->UrlAt(relay.Port(), "big"), program = BuildPath("bin/zep");
   int terminal = -1;
   pid_t const child = ::forkpty(&terminal, nullptr, nullptr, nullptr);
   if (child == 0) {

@@ -48,7 +48,7 @@ protected:
   TRun RunInside(std::string const& settings, std::string const& command) {
     WriteFile(fDir.Path("command"), command);
     std::string const call = "PATH=$PATH:/usr/sbin:/sbin PROBE=" WPAD_PROBE " ZEP=" TEST_BIN_DIR "/zep HURRY=" WPAD_HURRY " " +
-                             settings + " timeout 60 " ZEP_SOURCE_DIR "/tests/system/wpad/run-in-netns.sh bash " +
+                             settings + " timeout 60 " + SourcePath("tests/system/wpad/run-in-netns.sh") + " bash " +
                              fDir.Path("command") + " < /dev/null > " + fDir.Path("out") + " 2> " + fDir.Path("err");
     int const status = std::system(call.c_str());
     return {WIFEXITED(status) ? WEXITSTATUS(status) : -1, ReadFile(fDir.Path("out")), ReadFile(fDir.Path("err"))};

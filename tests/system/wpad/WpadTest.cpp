@@ -60,7 +60,7 @@ protected:
   }
 };
 
-std::string const kRecorded = "WPAD_SERVER=bytes WPAD_REPLY=" ZEP_TEST_DATA_DIR "/wpad/reply-kea.hex ";
+std::string const kRecorded = "WPAD_SERVER=bytes WPAD_REPLY=" + TestDataPath("wpad/reply-kea.hex") + " ";
 
 // ---- Replies ----
 

@@ -250,7 +250,7 @@ TEST_F(MofTest, AFailureIsAlsoPrintedAsADocument) {
 // The blocks of docs/schemas.md that begin with "$ zep", each with its first line.
 std::vector<std::string> ConsoleBlocks() {
   std::vector<std::string> blocks;
-  std::string const page = ReadFile(ZEP_SOURCE_DIR "/docs/schemas.md");
+  std::string const page = ReadFile(SourcePath("docs/schemas.md"));
   std::string const fence = "```console\n";
   for (std::size_t at = page.find(fence); at != page.npos; at = page.find(fence, at + 1)) {
     std::size_t const start = at + fence.size();
@@ -264,11 +264,11 @@ TEST_F(MofTest, ThePageOnSchemasShowsTheActualOutput) {
   ASSERT_EQ(blocks.size(), 2u);
   TCall call;
   call.arguments = {"mof", "examples/Disks/disks.mof"};
-  call.directory = ZEP_SOURCE_DIR;
+  call.directory = SourcePath();
   EXPECT_EQ(blocks[0], "$ zep mof examples/Disks/disks.mof\n" + fZep.Run(call).output);
 
   fZep.Add("libDisks.nsp.so", DISKS_PLUGIN);
-  fZep.Add("disks.mof", ZEP_SOURCE_DIR "/examples/Disks/disks.mof");
+  fZep.Add("disks.mof", SourcePath("examples/Disks/disks.mof"));
   EXPECT_EQ(blocks[1], "$ zep show 'X_Disk.Name=\"sda\"'\n" + Run({"show", "X_Disk.Name=\"sda\""}).output);
 }
 

@@ -19,7 +19,7 @@ using testing::HasSubstr;
 using testing::IsEmpty;
 using testing::StartsWith;
 
-std::string Sample() { return ReadFile(ZEP_TEST_DATA_DIR "/lsblk/devices.json"); }
+std::string Sample() { return ReadFile(TestDataPath("lsblk/devices.json")); }
 
 // ---- Names ----
 
@@ -216,7 +216,7 @@ protected:
 
 TEST_F(MediaCommandTest, ListsMediaAsATable) {
   // The stand-in renames the optical drives to names that no machine has, because this machine's drives may be empty.
-  AddStandIn("lsblk", "sed s,/dev/sr,/dev/xr, " ZEP_TEST_DATA_DIR "/lsblk/devices.json");
+  AddStandIn("lsblk", "sed s,/dev/sr,/dev/xr, " + TestDataPath("lsblk/devices.json"));
   AddStandIn("blkid", "test $4 != /dev/sdb1 || printf 'LABEL=STICK\\nTYPE=vfat\\n'");
   if (fs::exists("/run/udev/data")) GTEST_SKIP() << "zep does not run blkid where udev runs";
   NEEDS(::geteuid() == 0, "zep runs blkid only as root");
@@ -299,7 +299,7 @@ TEST_F(MediaCommandTest, AFailureOfLsblkIsReported) {
 
 TEST_F(MediaCommandTest, UnreadableLabelsAreReported) {
   if (fs::exists("/run/udev/data")) GTEST_SKIP() << "where udev runs, everyone can read labels";
-  AddStandIn("lsblk", "cat " ZEP_TEST_DATA_DIR "/lsblk/devices.json");
+  AddStandIn("lsblk", "cat " + TestDataPath("lsblk/devices.json"));
   AddStandIn("blkid", "echo LABEL=never read");
   TRun const run = Run({"--json"}, true);
   EXPECT_EQ(run.status, 2);
