@@ -201,21 +201,12 @@ std::vector<std::string> FieldsOf(fs::path const& source) {
   return fields;
 }
 
-// Here the fields have plain names: the tests of the transfers, and what they share with others.
-bool HasPlainFields(fs::path const& source) {
-  std::string const path = fs::relative(source, kSource / "tests").string();
-  for (char const* beginning :
-       {"system/transfer/", "tools/zep/transfer/", "tools/zep/secrets/", "tools/zep/Zep.h", "os/Programs.h"})
-    if (path.rfind(beginning, 0) == 0) return true;
-  return false;
-}
-
 TEST(HouseTest, FieldsOfTestsBeginWithF) {
   static std::regex const isOfTheHouse("(f[A-Z0-9]|k[A-Z]).*");
   int checked = 0;
   for (fs::path const& source : SourcesOf("tests"))
     for (std::string const& field : FieldsOf(source)) {
-      EXPECT_TRUE(HasPlainFields(source) || std::regex_match(field, isOfTheHouse)) << source << ": " << field;
+      EXPECT_TRUE(std::regex_match(field, isOfTheHouse)) << source << ": " << field;
       ++checked;
     }
   EXPECT_GT(checked, 500);

@@ -35,17 +35,17 @@ TEST_F(ScriptsTest, WithoutSudoTheMissingPackagesAreNamed) {
   Program("id", "echo 1000");
   Program("dpkg-query", "exit 1");
   TProgramRun const run = Run("need_packages build");
-  EXPECT_EQ(run.exitCode, 1);
-  EXPECT_THAT(run.output, testing::StartsWith("Packages are missing, and sudo is not installed. Run as root: "
-                                              "apt-get install cmake "));
-  EXPECT_EQ(run.output.find("command not found"), std::string::npos) << run.output;
+  EXPECT_EQ(run.fExitCode, 1);
+  EXPECT_THAT(run.fOutput, testing::StartsWith("Packages are missing, and sudo is not installed. Run as root: "
+                                               "apt-get install cmake "));
+  EXPECT_EQ(run.fOutput.find("command not found"), std::string::npos) << run.fOutput;
 }
 
 TEST_F(ScriptsTest, WithSudoThePackagesAreInstalled) {
   Program("id", "echo 1000");
   Program("dpkg-query", "exit 1");
   Program("sudo", "echo sudo \"$1\" >&2");
-  EXPECT_THAT(Run("need_packages build").output, testing::HasSubstr("sudo apt-get\nsudo env\n"));
+  EXPECT_THAT(Run("need_packages build").fOutput, testing::HasSubstr("sudo apt-get\nsudo env\n"));
 }
 
 }  // namespace

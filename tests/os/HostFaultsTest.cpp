@@ -39,8 +39,8 @@ TOutcome Do(std::string const& operation, std::string const& fault = "") {
   TProgramRun const run = RunProgram("cd " + dir.Path() + " && PATH=" + dir.Path("bin") + ":$PATH ZEP_FAULT=" + fault +
                                      " LD_PRELOAD=" ZEP_FAULTS " timeout 30 " + program + " < /dev/null 2> /dev/null");
   TOutcome outcome{{}, {}, false};
-  if (run.exitCode != 0) outcome.fLines.push_back("exit code " + std::to_string(run.exitCode));
-  std::istringstream output(run.output);
+  if (run.fExitCode != 0) outcome.fLines.push_back("exit code " + std::to_string(run.fExitCode));
+  std::istringstream output(run.fOutput);
   std::string line;
   while (std::getline(output, line) && line != "calls") {
     if (line == "fault")

@@ -202,8 +202,8 @@ TEST_F(TLoggerTest, ALogEntryAfterTheEndOfTheLoggerGetsANewOneWithoutAFile) {
 
 TEST_F(TLoggerTest, ObjectsMayLogAtTheEndOfTheProcess) {
   TProgramRun const run = RunProgram(BuildPath("tests/programs/LogAtTheEnd") + " " + Path("a.log"));
-  EXPECT_EQ(run.output, "a thread-local object\na static object\na registered provider\n");
-  EXPECT_EQ(run.exitCode, 0);
+  EXPECT_EQ(run.fOutput, "a thread-local object\na static object\na registered provider\n");
+  EXPECT_EQ(run.fExitCode, 0);
   EXPECT_THAT(ReadFile(Path("a.log")),
               MatchesRegex(kOpenBanner + "FDR_.Status. [/0-9]+  [:0-9]+ a thread-local object\n" + kCloseBanner));
 }

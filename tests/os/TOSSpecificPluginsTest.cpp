@@ -189,8 +189,8 @@ protected:
   // Returns the output of the program, which uses the core library in that directory.
   static std::vector<std::string> Probe(std::string const& directory, std::string const& arguments) {
     TProgramRun const run = RunProgram("LD_LIBRARY_PATH='" + directory + "' " + kProbe + " " + arguments);
-    EXPECT_EQ(run.exitCode, 0);
-    return LinesOf(run.output);
+    EXPECT_EQ(run.fExitCode, 0);
+    return LinesOf(run.fOutput);
   }
   std::vector<std::string> Probe(std::string const& arguments) const { return Probe(fDir.Path(), arguments); }
 
@@ -206,8 +206,8 @@ TEST_F(RootPathTest, IsTheNameThatTheDynamicLinkerUses) {
   fs::create_directory(fDir.Path("link"));
   fs::create_symlink("../libzepcore.so", fDir.Path("link/libzepcore.so"));
   EXPECT_THAT(Probe(fDir.Path("link"), "root"), ElementsAre(fDir.Path("link")));
-  EXPECT_EQ(RunProgram("cd " + fDir.Path() + " && LD_LIBRARY_PATH=. " + kProbe + " root").output, ".\n");
-  EXPECT_EQ(RunProgram("cd " + fDir.Path() + " && LD_LIBRARY_PATH=:/nowhere " + kProbe + " root").output, ".\n");
+  EXPECT_EQ(RunProgram("cd " + fDir.Path() + " && LD_LIBRARY_PATH=. " + kProbe + " root").fOutput, ".\n");
+  EXPECT_EQ(RunProgram("cd " + fDir.Path() + " && LD_LIBRARY_PATH=:/nowhere " + kProbe + " root").fOutput, ".\n");
 }
 
 TEST_F(RootPathTest, ALibraryNameOfUpTo511BytesIsTaken) {
@@ -267,10 +267,10 @@ TEST_F(RootPathTest, PassesOverDirectoriesAndDeadLinks) {
 TEST_F(RootPathTest, ARootThatCannotBeOpenedIsAFileSystemError) {
   // Found by a relative name, which leads nowhere from another working directory.
   TProgramRun const run = RunProgram("cd " + fDir.Path() + " && LD_LIBRARY_PATH=. " + kProbe + " nsps");
-  EXPECT_EQ(run.output, "");
+  EXPECT_EQ(run.fOutput, "");
   fs::create_directory(fDir.Path("zep-plug-ins"));
   fs::copy_file(kLibrary, fDir.Path("zep-plug-ins/libzepcore.so"));
-  EXPECT_EQ(RunProgram("cd " + fDir.Path() + " && LD_LIBRARY_PATH=zep-plug-ins " + kProbe + " nsps-elsewhere").output,
+  EXPECT_EQ(RunProgram("cd " + fDir.Path() + " && LD_LIBRARY_PATH=zep-plug-ins " + kProbe + " nsps-elsewhere").fOutput,
             "threw kZEPStatusFileSystemError\n");
 }
 

@@ -686,8 +686,8 @@ class SpawnAThousandTimesTest : public testing::TestWithParam<char const*> {};
 
 TEST_P(SpawnAThousandTimesTest, LeaksNothing) {
   TProgramRun const run = RunProgram(BuildPath("tests/programs/SpawnsAThousandTimes") + " " + GetParam());
-  EXPECT_EQ(run.exitCode, 0);  // also without a report of a leak sanitizer
-  EXPECT_EQ(run.output, "0 descriptors, no children, 0 bytes\n");
+  EXPECT_EQ(run.fExitCode, 0);  // also without a report of a leak sanitizer
+  EXPECT_EQ(run.fOutput, "0 descriptors, no children, 0 bytes\n");
 }
 
 INSTANTIATE_TEST_SUITE_P(Forms, SpawnAThousandTimesTest,

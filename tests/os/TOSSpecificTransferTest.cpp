@@ -324,8 +324,8 @@ TEST_F(LoadingCurlTest, TheFirstThatLoadsIsUsedByEachCall) {
     SCOPED_TRACE(row.fUsed);
     row.fPrepare();
     TProgramRun const run = Probe();
-    EXPECT_EQ(run.output, row.fUsed + "\ndone\n" + row.fUsed + "\ndone\n");
-    EXPECT_EQ(run.exitCode, 0);
+    EXPECT_EQ(run.fOutput, row.fUsed + "\ndone\n" + row.fUsed + "\ndone\n");
+    EXPECT_EQ(run.fExitCode, 0);
   }
 }
 
@@ -338,15 +338,15 @@ TEST_F(LoadingCurlTest, WithoutOneEachCallTriesEveryNameAgain) {
       "kZEPStatusLibCurlFailure\n"
       "TOSSpecific|CurlTransferFile: Error opening curl library: "
       "libcurl.so.2: cannot open shared object file: No such file or directory\n";
-  EXPECT_EQ(Probe().output, failure + failure);
+  EXPECT_EQ(Probe().fOutput, failure + failure);
   std::string const ofProxy =
       "kZEPStatusLibCurlFailure\n"
       "TOSSpecific|CheckProxySetting: Error opening curl library: "
       "libcurl.so.2: cannot open shared object file: No such file or directory\n";
-  EXPECT_EQ(Probe("--proxy").output, ofProxy + ofProxy);
+  EXPECT_EQ(Probe("--proxy").fOutput, ofProxy + ofProxy);
   // A library that is added between the two calls is found by the second call.
   std::string const late = Root("libcurl.so.4");
-  EXPECT_EQ(Probe(kStandIn + " " + late).output, failure + late + "\ndone\n");
+  EXPECT_EQ(Probe(kStandIn + " " + late).fOutput, failure + late + "\ndone\n");
 }
 
 // ---- The write callback ----

@@ -87,8 +87,8 @@ protected:
     arguments.insert(arguments.begin(), "remote");
     arguments.insert(arguments.end(), {"--user", user});
     zep::TCall call = {arguments};
-    call.environment = {{"ZEP_BMC_PASSWORD", password}};
-    call.hasNoTerminal = true;
+    call.fEnvironment = {{"ZEP_BMC_PASSWORD", password}};
+    call.fHasNoTerminal = true;
     return fZep.Run(call);
   }
 
@@ -99,21 +99,21 @@ TEST_F(ZepRemoteTest, PrintsTypeModelAndSerialNumber) {
   TSimulator simulator({});
   simulator.WaitUntilReady();
   zep::TRun const run = Run({"127.0.0.1"});
-  EXPECT_EQ(run.status, 0);
-  EXPECT_EQ(run.output, "Remote server    127.0.0.1\nMachine type     1234\nModel            AB7\nSerial number    KQ12345\n");
-  EXPECT_EQ(run.errors, "");
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_EQ(run.fOutput, "Remote server    127.0.0.1\nMachine type     1234\nModel            AB7\nSerial number    KQ12345\n");
+  EXPECT_EQ(run.fErrors, "");
 
   zep::TRun const json = Run({"127.0.0.1", "--json"});
-  EXPECT_EQ(json.status, 0);
-  zep::ExpectEnvelope(json.output, 0, "zep remote");
+  EXPECT_EQ(json.fStatus, 0);
+  zep::ExpectEnvelope(json.fOutput, 0, "zep remote");
   EXPECT_EQ(zep::JsonOf(json)["type"], "1234");
   EXPECT_EQ(zep::JsonOf(json)["model"], "AB7");
   EXPECT_EQ(zep::JsonOf(json)["serialNumber"], "KQ12345");
 
   WriteFile(fDir.Path("password"), "zeppass1\nnot this line");
-  EXPECT_EQ(Run({"127.0.0.1", "--password-file", fDir.Path("password")}, "wrong").status, 0) << "the file takes precedence";
+  EXPECT_EQ(Run({"127.0.0.1", "--password-file", fDir.Path("password")}, "wrong").fStatus, 0) << "the file takes precedence";
   WriteFile(fDir.Path("password"), "zeppass1\r\n");
-  EXPECT_EQ(Run({"127.0.0.1", "--password-file", fDir.Path("password")}, "wrong").status, 0)
+  EXPECT_EQ(Run({"127.0.0.1", "--password-file", fDir.Path("password")}, "wrong").fStatus, 0)
       << "a line end written by another system's editor";
 }
 
@@ -121,18 +121,18 @@ TEST_F(ZepRemoteTest, AWrongPasswordIsReported) {
   TSimulator simulator({});
   simulator.WaitUntilReady();
   zep::TRun const run = Run({"127.0.0.1"}, "secret7");
-  EXPECT_EQ(run.status, 1);
-  EXPECT_THAT(run.errors, HasSubstr("zep: 127.0.0.1: no session with the controller after N s: wrong password\n"));
-  EXPECT_EQ((run.output + run.errors).find("secret7"), std::string::npos);
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_THAT(run.fErrors, HasSubstr("zep: 127.0.0.1: no session with the controller after N s: wrong password\n"));
+  EXPECT_EQ((run.fOutput + run.fErrors).find("secret7"), std::string::npos);
 }
 
 TEST_F(ZepRemoteTest, TheReasonOfAMissingSessionIsReported) {
   TSimulator simulator({});
   simulator.WaitUntilReady();
-  EXPECT_THAT(Run({"127.0.0.1"}, "zeppass1", "nobody").errors, HasSubstr(" s: unknown user, or the account is disabled\n"));
-  EXPECT_THAT(Run({"no-such-host.invalid"}).errors, HasSubstr(" s: the host name has no address\n"));
-  EXPECT_THAT(Run({"198.51.100.1"}).errors, HasSubstr(" s: this system cannot send to the host\n"));
-  EXPECT_THAT(Run({"127.0.0.2"}).errors, HasSubstr(" s: no answer\n"));
+  EXPECT_THAT(Run({"127.0.0.1"}, "zeppass1", "nobody").fErrors, HasSubstr(" s: unknown user, or the account is disabled\n"));
+  EXPECT_THAT(Run({"no-such-host.invalid"}).fErrors, HasSubstr(" s: the host name has no address\n"));
+  EXPECT_THAT(Run({"198.51.100.1"}).fErrors, HasSubstr(" s: this system cannot send to the host\n"));
+  EXPECT_THAT(Run({"127.0.0.2"}).fErrors, HasSubstr(" s: no answer\n"));
 }
 
 TEST_F(ZepRemoteTest, AMissingPartIsReported) {
@@ -141,10 +141,10 @@ TEST_F(ZepRemoteTest, AMissingPartIsReported) {
   TSimulator simulator(settings);
   simulator.WaitUntilReady();
   zep::TRun const run = Run({"127.0.0.1", "--json"});
-  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(run.fStatus, 2);
   EXPECT_EQ(zep::JsonOf(run)["type"], "1234");
   EXPECT_TRUE(zep::JsonOf(run)["serialNumber"].is_null());
-  zep::ExpectEnvelope(run.output, 2, "zep remote");
+  zep::ExpectEnvelope(run.fOutput, 2, "zep remote");
   EXPECT_EQ(zep::JsonOf(run)["reason"], "the controller did not report everything");
 }
 
@@ -172,7 +172,7 @@ TEST_F(ZepRemoteTest, UnprogrammedFruDataAreReportedAsSuch) {
     TSimulator simulator(settings);
     simulator.WaitUntilReady();
     zep::TRun const run = Run({"127.0.0.1", "--json"});
-    EXPECT_EQ(run.status, row.fStatus);
+    EXPECT_EQ(run.fStatus, row.fStatus);
     auto const document = zep::JsonOf(run);
     EXPECT_EQ(document["type"], orNull(row.fType));
     EXPECT_EQ(document["model"], orNull(row.fModel));
@@ -186,9 +186,9 @@ TEST_F(ZepRemoteTest, ThePasswordReachesNeitherOutputNorLog) {
   simulator.WaitUntilReady();
   std::string const log = fDir.Path("log");
   zep::TRun const run = Run({"127.0.0.1", "--debug-log", log});
-  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.fStatus, 0);
   EXPECT_THAT(ReadFile(log), HasSubstr("rspBuffer for GetRemoteMSN:"));
-  EXPECT_EQ((run.output + run.errors + ReadFile(log)).find("zeppass1"), std::string::npos);
+  EXPECT_EQ((run.fOutput + run.fErrors + ReadFile(log)).find("zeppass1"), std::string::npos);
 }
 
 TEST_F(ZepRemoteTest, AControllerThatAnswersAfter1500MillisecondsIsQueriedWithTheUsualTimeout) {
@@ -201,8 +201,8 @@ TEST_F(ZepRemoteTest, AControllerThatAnswersAfter1500MillisecondsIsQueriedWithTh
     return TRelay::TFate{std::chrono::milliseconds(datagram.fIsAnswer ? 1500 : 0)};
   });
   zep::TRun const run = Run({"127.0.0.1"});
-  EXPECT_EQ(run.status, 0) << run.errors;
-  EXPECT_THAT(run.output, HasSubstr("Serial number    "));
+  EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+  EXPECT_THAT(run.fOutput, HasSubstr("Serial number    "));
 }
 
 TEST_F(ZepRemoteTest, EachHostHasATimeLimit) {
@@ -210,8 +210,8 @@ TEST_F(ZepRemoteTest, EachHostHasATimeLimit) {
   auto const start = TClock::now();
   zep::TRun const run = Run({"127.0.0.1", "--timeout", "1"});
   EXPECT_LT(SecondsSince(start), 15);
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: 127.0.0.1: no result after 1 s; --timeout allows more\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: 127.0.0.1: no result after 1 s; --timeout allows more\n");
 }
 
 // The list has controllers that answer, that refuse the account, that are silent, and that cannot be reached.
@@ -245,11 +245,11 @@ TEST_F(ZepRemoteTest, AListOfAThousandHostsIsCompletedAlthoughSomeFail) {
   auto const start = TClock::now();
   zep::TRun const run = Run({"--hosts", fDir.Path("hosts"), "--parallel", "50"});
   EXPECT_LT(SecondsSince(start), 60);
-  EXPECT_EQ(run.status, 2);
-  EXPECT_EQ(run.errors, "zep: 1000 of 1000 hosts done, 110 failed\n");
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_EQ(run.fErrors, "zep: 1000 of 1000 hosts done, 110 failed\n");
   std::multiset<std::string> told, asked;
   for (std::string const& line : zep::LinesOf(hosts)) asked.insert(line);
-  for (std::string const& line : zep::LinesOf(run.output)) {
+  for (std::string const& line : zep::LinesOf(run.fOutput)) {
     auto const json = nlohmann::json::parse(line);
     std::string const host = json["host"];
     told.insert(host);

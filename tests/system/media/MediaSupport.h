@@ -17,8 +17,8 @@ namespace NQRVZEP20 {
 // Runs a shell command. Throws, with its output, when it fails.
 inline std::string Do(std::string const& command) {
   TProgramRun const run = RunProgram("(" + command + ") 2>&1");
-  if (run.exitCode != 0) throw std::runtime_error(command + ": " + run.output);
-  return run.output;
+  if (run.fExitCode != 0) throw std::runtime_error(command + ": " + run.fOutput);
+  return run.fOutput;
 }
 
 // For use in a child: makes /mnt and /run private file systems of the child; /mnt has the two directories for media.
@@ -63,7 +63,7 @@ inline bool HasLoopDevicesForItself() {
 // Whether this process can mount images.
 inline bool MayMountImages() {
   return MayMount() && HasLoopDevicesForItself() &&
-         RunProgram("/usr/sbin/losetup --find >/dev/null 2>&1 && test -x /usr/sbin/mke2fs").exitCode == 0;
+         RunProgram("/usr/sbin/losetup --find >/dev/null 2>&1 && test -x /usr/sbin/mke2fs").fExitCode == 0;
 }
 
 #define NEEDS_IMAGES() NEEDS(MayMountImages(), "mounting images needs root, loop devices and e2fsprogs")

@@ -29,11 +29,11 @@ class MediaVmTest : public testing::Test {
 protected:
   static void SetUpTestSuite() {
     for (char const* tool : {"qemu-system-x86_64", "busybox", "cpio", "modprobe", "mkfs.vfat", "hwinfo", "lsblk", "blkid"})
-      if (RunProgram(std::string("PATH=$PATH:/usr/sbin:/sbin; command -v ") + tool).exitCode != 0)
+      if (RunProgram(std::string("PATH=$PATH:/usr/sbin:/sbin; command -v ") + tool).fExitCode != 0)
         gMissing = std::string(tool) + " is not installed";
     if (!gMissing.empty()) return;
     TProgramRun const fetch = RunProgram("sh " + kVm + "fetch-kernel.sh full 2>&1");
-    if (fetch.exitCode != 0) gMissing = "no kernel: " + fetch.output;
+    if (fetch.fExitCode != 0) gMissing = "no kernel: " + fetch.fOutput;
     if (!gMissing.empty()) return;
 
     auto const start = std::chrono::steady_clock::now();
@@ -51,7 +51,7 @@ protected:
 
   void SetUp() override {
     NEEDS(gMissing.empty(), gMissing);
-    ASSERT_EQ(gRun.exitCode, 0) << gRun.output;
+    ASSERT_EQ(gRun.fExitCode, 0) << gRun.fOutput;
   }
 
   static std::string Result(std::string const& name) { return ReadFile(gResults->Path(name)); }
@@ -65,7 +65,7 @@ private:
   static std::string Files() {
     std::string files;
     for (char const* program : {"hwinfo", "lsblk", "blkid"}) {
-      std::string const path = RunProgram(std::string("PATH=$PATH:/usr/sbin:/sbin; command -v ") + program).output;
+      std::string const path = RunProgram(std::string("PATH=$PATH:/usr/sbin:/sbin; command -v ") + program).fOutput;
       files += " --file " + path.substr(0, path.find('\n'));
     }
     for (std::string const& file :

@@ -57,7 +57,7 @@ protected:
 
   std::string Zep(std::vector<std::string> const& arguments) {
     TRun const run = fInstallation->Run({arguments});
-    return run.output + run.errors + "exit status " + std::to_string(run.status) + "\n";
+    return run.fOutput + run.fErrors + "exit status " + std::to_string(run.fStatus) + "\n";
   }
   std::string Report(std::string const& device, std::vector<std::string> arguments = {}) {
     arguments.insert(arguments.begin(), {"report", "--sample", "--to-media", device});
@@ -120,9 +120,9 @@ TEST_F(ZepMediaTest, MountsForACallerThatIgnoresItsChildren) {
               for (std::vector<std::string> const& arguments :
                    {std::vector<std::string>{"media", "mount", loop.Path()}, {"media", "umount", "/mnt/key"}}) {
                 TCall call = {arguments};
-                call.ignoresChildren = true;
+                call.fIgnoresChildren = true;
                 TRun const run = fInstallation->Run(call);
-                text += run.output + run.errors;
+                text += run.fOutput + run.fErrors;
               }
               return Replaced(text, loop.Path(), "LOOP");
             }),
@@ -134,9 +134,9 @@ TEST_F(ZepMediaTest, WithoutTheProgramMountItsPackageIsNamed) {
   EXPECT_EQ(WithZep([&] {
               TLoopDevice const loop(fDir.Path("key"));
               TCall call = {{"media", "mount", loop.Path()}};
-              call.environment = {{"PATH", fDir.Path()}};
+              call.fEnvironment = {{"PATH", fDir.Path()}};
               TRun const run = fInstallation->Run(call);
-              return run.errors + std::to_string(run.status);
+              return run.fErrors + std::to_string(run.fStatus);
             }),
             "zep: the program mount is missing; install the package mount\n1");
 }
@@ -268,11 +268,11 @@ TEST_F(ZepMediaTest, AMediumThatIsAlsoMountedElsewhereCannotBeRemoved) {
               std::string text = Zep({"media", "mount", loop.Path()});
               text += Zep({"media", "umount", "/mnt/key"});
               TRun const report = fInstallation->Run({{"report", "--sample", "--to-media", loop.Path()}});
-              text += "..." + report.output.substr(report.output.find(" on ")) + "exit status " + std::to_string(report.status) +
-                      "\n";
+              text += "..." + report.fOutput.substr(report.fOutput.find(" on ")) + "exit status " +
+                      std::to_string(report.fStatus) + "\n";
               Do("umount '/mnt/b c'; mount " + loop.Path() + " /mnt/key");
               TRun const unmounted = fInstallation->Run({{"media", "umount", "/mnt/key", "--json"}});
-              ExpectEnvelope(unmounted.output, 2, "zep media umount");
+              ExpectEnvelope(unmounted.fOutput, 2, "zep media umount");
               text += JsonOf(unmounted)["stillMountedAt"].dump() + "\n";
               TRun const asJson = fInstallation->Run({{"report", "--json", "--sample", "--to-media", loop.Path()}});
               text += JsonOf(asJson)["stillMountedAt"].dump() + "\n";
@@ -346,14 +346,14 @@ TEST_F(ZepMediaTest, AReportIsOnTheMediumWhenZepEnds) {
   EXPECT_EQ(WithZep([&] {
               TLoopDevice const loop(fDir.Path("key"));
               TRun const run = fInstallation->Run({{"report", "--sample", "--to-media", loop.Path()}});
-              EXPECT_EQ(run.status, 0) << run.errors;
-              EXPECT_EQ(run.errors, "");
+              EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+              EXPECT_EQ(run.fErrors, "");
               std::vector<std::string> names = NamesIn(fDir.Path("key"));  // read from the image itself, not through the device
               std::sort(names.begin(), names.end());
               EXPECT_EQ(names.size(), 2u) << Joined(names);
               if (names.size() != 2) return "no report";
               EXPECT_THAT(names[1], testing::MatchesRegex("zep-report-sample-server-20[0-9]{6}T[0-9]{6}Z\\.txt"));
-              EXPECT_EQ(run.output, "The report is " + names[1] + " on " + loop.Path() + ", which can be removed.\n");
+              EXPECT_EQ(run.fOutput, "The report is " + names[1] + " on " + loop.Path() + ", which can be removed.\n");
               EXPECT_THAT(ReadFile("/proc/self/mounts"), Not(HasSubstr("/mnt/key")));
 
               Do("mount " + fDir.Path("key") + " /mnt/key");
@@ -372,7 +372,7 @@ TEST_F(ZepMediaTest, WithJsonBothTheFileAndTheOutputAreJson) {
   EXPECT_EQ(WithZep([&] {
               TLoopDevice const loop(fDir.Path("key"));
               TRun const run = fInstallation->Run({{"report", "--json", "--sample", "--to-media", loop.Path()}});
-              EXPECT_EQ(run.status, 0) << run.errors;
+              EXPECT_EQ(run.fStatus, 0) << run.fErrors;
               auto const answer = JsonOf(run);
               ExpectEnvelope(answer, 0, "zep report --to-media");
               EXPECT_EQ(answer["device"], loop.Path());
@@ -445,7 +445,7 @@ TEST_F(ZepMediaTest, ALoopDeviceDetachedDuringTheWriteStillReceivesTheReport) {
     TRun const run = fInstallation->Run(
         {{"report", "--sample", "--to-media", loop.Path()},
          {{"LD_PRELOAD", ZEP_PULLS_OUT}, {"ZEP_PULL", "/usr/sbin/losetup --detach " + loop.Path()}, {"ZEP_PULL_AT", "1"}}});
-    return run.errors + "exit status " + std::to_string(run.status) + " " + Joined(NamesIn(fDir.Path("key")));
+    return run.fErrors + "exit status " + std::to_string(run.fStatus) + " " + Joined(NamesIn(fDir.Path("key")));
   });
   EXPECT_THAT(text, StartsWith("exit status 0 label.txt zep-report-sample-server-"));
 }
@@ -458,11 +458,11 @@ TEST_F(ZepMediaTest, AfterAnInterruptTheMediumIsUnmountedAndHasNoPartOfTheReport
     std::string const text = WithZep([&] {
       TLoopDevice const loop(fDir.Path("key"));
       TCall call = {{"report", "--sample", "--json", "--to-media", loop.Path()}};
-      call.environment = {{"LD_PRELOAD", ZEP_PULLS_OUT}, {"ZEP_RAISE", std::to_string(signal)}, {"ZEP_PULL_AT", "1"}};
+      call.fEnvironment = {{"LD_PRELOAD", ZEP_PULLS_OUT}, {"ZEP_RAISE", std::to_string(signal)}, {"ZEP_PULL_AT", "1"}};
       TRun const run = fInstallation->Run(call);
       bool const isMounted = !fs::is_empty("/mnt/key");
       if (isMounted) Do("umount /mnt/key");
-      return Replaced(run.errors, loop.Path(), "LOOP") + std::to_string(run.status) + " " + JsonOf(run)["exitStatus"].dump() +
+      return Replaced(run.fErrors, loop.Path(), "LOOP") + std::to_string(run.fStatus) + " " + JsonOf(run)["exitStatus"].dump() +
              (isMounted ? " mounted " : " unmounted ") + Joined(NamesIn(fDir.Path("key")));
     });
     std::string const status = std::to_string(128 + signal);
@@ -478,11 +478,11 @@ TEST_F(ZepMediaTest, InterruptAfterTheReportIsCompleteStillUnmountsTheMedium) {
   std::string const text = WithZep([&] {
     TLoopDevice const loop(fDir.Path("key"));
     TCall call = {{"report", "--sample", "--to-media", loop.Path()}};
-    call.environment = {{"LD_PRELOAD", ZEP_PULLS_OUT}, {"ZEP_RAISE", std::to_string(SIGINT)}, {"ZEP_PULL_AT", "2"}};
+    call.fEnvironment = {{"LD_PRELOAD", ZEP_PULLS_OUT}, {"ZEP_RAISE", std::to_string(SIGINT)}, {"ZEP_PULL_AT", "2"}};
     TRun const run = fInstallation->Run(call);
     bool const isMounted = !fs::is_empty("/mnt/key");
     if (isMounted) Do("umount /mnt/key");
-    return Replaced(run.output + run.errors, loop.Path(), "LOOP") + std::to_string(run.status) +
+    return Replaced(run.fOutput + run.fErrors, loop.Path(), "LOOP") + std::to_string(run.fStatus) +
            (isMounted ? " mounted " : " unmounted ") + Joined(NamesIn(fDir.Path("key")));
   });
   EXPECT_THAT(text,

@@ -20,21 +20,21 @@ namespace NQRVZEP20::zep {
 namespace fs = std::filesystem;
 
 struct TRun {
-  int status;  // the exit status, or 128 and the number of the signal that ended it
-  std::string output, errors;
+  int fStatus;  // the exit status, or 128 and the number of the signal that ended it
+  std::string fOutput, fErrors;
 };
 
 // How zep is called.
 struct TCall {
-  std::vector<std::string> arguments;
-  std::map<std::string, std::string> environment = {};
-  bool asNobody = false;            // run as a user without privileges
-  bool ignoresBrokenPipes = false;  // run with SIGPIPE ignored, as some callers do
-  bool ignoresChildren = false;     // run with SIGCHLD ignored, as some callers do
-  std::string outputFile = {};      // receives standard output, which is then not read back
-  int outputDescriptor = -1;        // the same as an open descriptor; -1: none
-  std::string directory = {};       // the working directory; empty: the caller's
-  bool hasNoTerminal = false;       // run in a session of its own
+  std::vector<std::string> fArguments;
+  std::map<std::string, std::string> fEnvironment = {};
+  bool fAsNobody = false;            // run as a user without privileges
+  bool fIgnoresBrokenPipes = false;  // run with SIGPIPE ignored, as some callers do
+  bool fIgnoresChildren = false;     // run with SIGCHLD ignored, as some callers do
+  std::string fOutputFile = {};      // receives standard output, which is then not read back
+  int fOutputDescriptor = -1;        // the same as an open descriptor; -1: none
+  std::string fDirectory = {};       // the working directory; empty: the caller's
+  bool fHasNoTerminal = false;       // run in a session of its own
 };
 
 // Replaces durations, which differ from run to run: "after 0.1 s" becomes "after N s".
@@ -78,21 +78,21 @@ public:
 
 private:
   [[noreturn]] void Exec(TCall const& call) const {
-    if (!RedirectTo(call.outputFile.empty() ? Path("out") : call.outputFile, STDOUT_FILENO)) ::_exit(126);
-    if (call.outputDescriptor >= 0) ::dup2(call.outputDescriptor, STDOUT_FILENO);
+    if (!RedirectTo(call.fOutputFile.empty() ? Path("out") : call.fOutputFile, STDOUT_FILENO)) ::_exit(126);
+    if (call.fOutputDescriptor >= 0) ::dup2(call.fOutputDescriptor, STDOUT_FILENO);
     if (!RedirectTo(Path("err"), STDERR_FILENO)) ::_exit(126);
-    if (!call.directory.empty() && ::chdir(call.directory.c_str()) != 0) ::_exit(126);
-    if (call.hasNoTerminal) ::setsid();
-    std::signal(SIGPIPE, call.ignoresBrokenPipes ? SIG_IGN : SIG_DFL);
-    std::signal(SIGCHLD, call.ignoresChildren ? SIG_IGN : SIG_DFL);
+    if (!call.fDirectory.empty() && ::chdir(call.fDirectory.c_str()) != 0) ::_exit(126);
+    if (call.fHasNoTerminal) ::setsid();
+    std::signal(SIGPIPE, call.fIgnoresBrokenPipes ? SIG_IGN : SIG_DFL);
+    std::signal(SIGCHLD, call.fIgnoresChildren ? SIG_IGN : SIG_DFL);
     for (char const* name : {"ZEP_SMBIOS_TABLE", "ZEP_HOST_NAME", "ZEP_BMC_PASSWORD", "LD_LIBRARY_PATH"}) ::unsetenv(name);
     ::setenv("ZEP_SCSI_DEVICES", Path("no-scsi-devices").c_str(), 1);  // hides the devices of this machine
-    for (auto const& [name, value] : call.environment) ::setenv(name.c_str(), value.c_str(), 1);
-    if (call.asNobody && !BecomeNobody()) ::_exit(126);
+    for (auto const& [name, value] : call.fEnvironment) ::setenv(name.c_str(), value.c_str(), 1);
+    if (call.fAsNobody && !BecomeNobody()) ::_exit(126);
 
     std::string const program = Path("bin/zep");
     std::vector<char*> arguments = {const_cast<char*>("zep")};
-    for (std::string const& argument : call.arguments) arguments.push_back(const_cast<char*>(argument.c_str()));
+    for (std::string const& argument : call.fArguments) arguments.push_back(const_cast<char*>(argument.c_str()));
     arguments.push_back(nullptr);
     ::execv(program.c_str(), arguments.data());
     ::_exit(127);
@@ -111,7 +111,7 @@ private:
   TTempDir fDir;
 };
 
-inline nlohmann::json JsonOf(TRun const& run) { return nlohmann::json::parse(run.output); }
+inline nlohmann::json JsonOf(TRun const& run) { return nlohmann::json::parse(run.fOutput); }
 
 inline std::vector<std::string> LinesOf(std::string const& text) {
   std::vector<std::string> lines;

@@ -14,16 +14,16 @@ class ArgumentsTest : public testing::Test {
 protected:
   TRun Run(std::vector<std::string> const& arguments) {
     TCall call = {arguments};
-    call.hasNoTerminal = true;
+    call.fHasNoTerminal = true;
     return fZep.Run(call);
   }
 
   void ExpectWrongUsage(std::vector<std::string> const& arguments, std::string const& why) {
     SCOPED_TRACE(testing::PrintToString(arguments));
     TRun const run = Run(arguments);
-    EXPECT_EQ(run.status, 64);
-    EXPECT_EQ(run.output, "");
-    EXPECT_EQ(run.errors, "zep: " + why + "\n");
+    EXPECT_EQ(run.fStatus, 64);
+    EXPECT_EQ(run.fOutput, "");
+    EXPECT_EQ(run.fErrors, "zep: " + why + "\n");
   }
 
   TInstallation fZep;
@@ -64,10 +64,10 @@ TEST_F(ArgumentsTest, WrongUsageIsReportedWithoutRepeatingTheArguments) {
 }
 
 TEST_F(ArgumentsTest, UnknownCommandIsNamed) {
-  EXPECT_EQ(Run({"bogus"}).errors, "zep: there is no command \"bogus\"\n");
-  EXPECT_EQ(Run({"bogus", "--json"}).errors, "zep: there is no command \"bogus\"\n");
-  EXPECT_EQ(Run({"media", "eject"}).errors, "zep: there is no command \"eject\"\n");
-  EXPECT_EQ(Run({}).errors, "zep: a command is required; zep --help lists all commands\n");
+  EXPECT_EQ(Run({"bogus"}).fErrors, "zep: there is no command \"bogus\"\n");
+  EXPECT_EQ(Run({"bogus", "--json"}).fErrors, "zep: there is no command \"bogus\"\n");
+  EXPECT_EQ(Run({"media", "eject"}).fErrors, "zep: there is no command \"eject\"\n");
+  EXPECT_EQ(Run({}).fErrors, "zep: a command is required; zep --help lists all commands\n");
 }
 
 TEST_F(ArgumentsTest, ArgumentsAreEscapedInMessages) {
@@ -79,11 +79,11 @@ TEST_F(ArgumentsTest, ArgumentsAreEscapedInMessages) {
                                                     {"remote", "h", "--user", "u", "--timeout", "\x1b[2J"}}) {
     SCOPED_TRACE(testing::PrintToString(arguments));
     TRun const run = Run(arguments);
-    EXPECT_EQ(run.status, 64);
-    EXPECT_THAT(run.errors, testing::StartsWith("zep: "));
-    EXPECT_EQ(run.errors.find('\x1b'), std::string::npos);
+    EXPECT_EQ(run.fStatus, 64);
+    EXPECT_THAT(run.fErrors, testing::StartsWith("zep: "));
+    EXPECT_EQ(run.fErrors.find('\x1b'), std::string::npos);
   }
-  EXPECT_EQ(Run({"show", "a", "--\x1b[2J"}).errors, "zep: there is no option --\\x1b[2J\n");
+  EXPECT_EQ(Run({"show", "a", "--\x1b[2J"}).fErrors, "zep: there is no option --\\x1b[2J\n");
 }
 
 TEST_F(ArgumentsTest, EmptyArgumentsAreRefused) {
@@ -125,13 +125,13 @@ TEST_F(ArgumentsTest, HelpThatCannotBeWrittenIsAFailure) {
        {std::vector<std::string>{"--help"}, {"report", "--help"}, {"media", "mount", "--help"}, {"--version"}}) {
     SCOPED_TRACE(testing::PrintToString(arguments));
     TCall call = {arguments};
-    call.outputFile = "/dev/full";
+    call.fOutputFile = "/dev/full";
     TRun const run = fZep.Run(call);
-    EXPECT_EQ(run.status, 1);
-    EXPECT_EQ(run.errors, "zep: standard output cannot be written: No space left on device\n");
+    EXPECT_EQ(run.fStatus, 1);
+    EXPECT_EQ(run.fErrors, "zep: standard output cannot be written: No space left on device\n");
     TRun const written = Run(arguments);
-    EXPECT_EQ(written.status, 0);
-    EXPECT_NE(written.output, "");
+    EXPECT_EQ(written.fStatus, 0);
+    EXPECT_NE(written.fOutput, "");
   }
 }
 

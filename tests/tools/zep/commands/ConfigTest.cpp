@@ -15,9 +15,9 @@ protected:
   TRun Run(std::vector<std::string> arguments, bool asNobody = false) {
     arguments.insert(arguments.begin(), "config");
     TCall call;
-    call.arguments = arguments;
-    call.directory = fDir.Path();
-    call.asNobody = asNobody;
+    call.fArguments = arguments;
+    call.fDirectory = fDir.Path();
+    call.fAsNobody = asNobody;
     return fZep.Run(call);
   }
   void Write(std::string const& text) { WriteFile(File(), text); }
@@ -42,44 +42,44 @@ std::string const kText =
 TEST_F(ConfigTest, ShowsTheSettingsWithTheirLinesAndTheIgnoredLinesWithTheReason) {
   Write(kText);
   TRun const run = Run({});
-  EXPECT_EQ(run.status, 0);
-  EXPECT_EQ(run.errors, "");
-  EXPECT_EQ(run.output, File() +
-                            "\n"
-                            "\n"
-                            "Line    Key                           Value\n"
-                            "10      a#b                           c#d\n"
-                            "9       crlf                          1\\x0d\n"
-                            "4       flag                          flag\n"
-                            "5       \"key \"                        \" value \"\n"
-                            "2       server                        alpha=beta\n"
-                            "\n"
-                            "Line    Ignored                       Why\n"
-                            "1       # comment                     a comment\n"
-                            "3                                     an empty line\n"
-                            "6       server=gamma                  line 2 already sets the key\n"
-                            "7       =no key                       no key before \"=\"\n"
-                            "8       empty=                        no value after \"=\"\n");
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_EQ(run.fErrors, "");
+  EXPECT_EQ(run.fOutput, File() +
+                             "\n"
+                             "\n"
+                             "Line    Key                           Value\n"
+                             "10      a#b                           c#d\n"
+                             "9       crlf                          1\\x0d\n"
+                             "4       flag                          flag\n"
+                             "5       \"key \"                        \" value \"\n"
+                             "2       server                        alpha=beta\n"
+                             "\n"
+                             "Line    Ignored                       Why\n"
+                             "1       # comment                     a comment\n"
+                             "3                                     an empty line\n"
+                             "6       server=gamma                  line 2 already sets the key\n"
+                             "7       =no key                       no key before \"=\"\n"
+                             "8       empty=                        no value after \"=\"\n");
 }
 
 TEST_F(ConfigTest, ShowsOneSettingAndTheIgnoredLinesOfItsKey) {
   Write(kText);
   TRun const run = Run({"server"});
-  EXPECT_EQ(run.status, 0);
-  EXPECT_EQ(run.output, File() +
-                            "\n"
-                            "\n"
-                            "Line    Key                           Value\n"
-                            "2       server                        alpha=beta\n"
-                            "\n"
-                            "Line    Ignored                       Why\n"
-                            "6       server=gamma                  line 2 already sets the key\n");
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_EQ(run.fOutput, File() +
+                             "\n"
+                             "\n"
+                             "Line    Key                           Value\n"
+                             "2       server                        alpha=beta\n"
+                             "\n"
+                             "Line    Ignored                       Why\n"
+                             "6       server=gamma                  line 2 already sets the key\n");
 }
 
 TEST_F(ConfigTest, PrintsJson) {
   Write("a=1\na=2\nflag\n");
   TRun const run = Run({"--json"});
-  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.fStatus, 0);
   auto const document = JsonOf(run);
   EXPECT_EQ(document["version"], 2);
   EXPECT_EQ(document["file"], File());
@@ -91,40 +91,40 @@ TEST_F(ConfigTest, PrintsJson) {
 
 TEST_F(ConfigTest, ReportsWhyThereAreNoSettings) {
   TRun run = Run({});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: " + File() + " does not exist\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fOutput, "");
+  EXPECT_EQ(run.fErrors, "zep: " + File() + " does not exist\n");
 
   Write("");
   run = Run({});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: " + File() + " is empty\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: " + File() + " is empty\n");
 
   Write("# comment\n");
   run = Run({});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_NE(run.output.find("a comment"), std::string::npos);
-  EXPECT_EQ(run.errors, "zep: " + File() + " contains no setting\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_NE(run.fOutput.find("a comment"), std::string::npos);
+  EXPECT_EQ(run.fErrors, "zep: " + File() + " contains no setting\n");
 
   Write("a=1\n");
   run = Run({"b"});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: " + File() + " does not set \"b\"\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fOutput, "");
+  EXPECT_EQ(run.fErrors, "zep: " + File() + " does not set \"b\"\n");
 
   fs::permissions(fDir.Path(), fs::perms::all);
   fs::permissions(File(), fs::perms::none);
   run = Run({"--json"}, true);
-  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.fStatus, 1);
   EXPECT_TRUE(JsonOf(run)["settings"].empty());
-  EXPECT_EQ(run.errors, "zep: " + File() + " cannot be read\n");
+  EXPECT_EQ(run.fErrors, "zep: " + File() + " cannot be read\n");
 }
 
 TEST_F(ConfigTest, APipeOfThatNameDoesNotBlock) {
   ASSERT_EQ(::mkfifo(File().c_str(), 0600), 0);
   TRun const run = Run({});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: " + File() + " is empty\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: " + File() + " is empty\n");
 }
 
 #ifdef FAILING_READ
@@ -132,16 +132,16 @@ TEST_F(ConfigTest, AFileThatCannotBeReadToItsEndIsReportedAsSuch) {
   std::string const text(100000, '#');
   Write("a=1\n" + text);
   TCall call;
-  call.arguments = {"config"};
-  call.directory = fDir.Path();
-  call.environment = {{"LD_PRELOAD", FAILING_READ}, {"ZEP_TEST_FAILING_FILE", File()}, {"ZEP_TEST_FAILING_BYTE", "50000"}};
+  call.fArguments = {"config"};
+  call.fDirectory = fDir.Path();
+  call.fEnvironment = {{"LD_PRELOAD", FAILING_READ}, {"ZEP_TEST_FAILING_FILE", File()}, {"ZEP_TEST_FAILING_BYTE", "50000"}};
   TRun const run = fZep.Run(call);
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: " + File() + " cannot be read to its end, so none of its settings is used\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: " + File() + " cannot be read to its end, so none of its settings is used\n");
 }
 #endif
 
-TEST_F(ConfigTest, AcceptsOnlyOneKey) { EXPECT_EQ(Run({"a", "b"}).status, 64); }
+TEST_F(ConfigTest, AcceptsOnlyOneKey) { EXPECT_EQ(Run({"a", "b"}).fStatus, 64); }
 
 }  // namespace
 }  // namespace NQRVZEP20::zep

@@ -35,25 +35,25 @@ protected:
 
   TRun Run(std::vector<std::string> const& arguments, std::string const& directory = "work") {
     TCall call = {arguments};
-    call.environment = {
+    call.fEnvironment = {
         {"ZEP_SMBIOS_TABLE", "/nowhere"}, {"HOME", "/nowhere"}, {"NETRC", "/dev/null"}, {"TMPDIR", fZep.Path("work")}};
-    call.directory = fZep.Path(directory);
-    call.hasNoTerminal = true;
+    call.fDirectory = fZep.Path(directory);
+    call.fHasNoTerminal = true;
     return fZep.Run(call);
   }
 
   void Expect(TRow const& row) {
     SCOPED_TRACE(testing::PrintToString(row.fArguments));
     TRun const run = Run(row.fArguments);
-    EXPECT_EQ(run.status, row.fStatus) << run.errors;
-    ExpectEnvelope(run.output, run.status, row.fDocument);
+    EXPECT_EQ(run.fStatus, row.fStatus) << run.fErrors;
+    ExpectEnvelope(run.fOutput, run.fStatus, row.fDocument);
   }
 
   // The names below "Subcommands:", each after the name of its command.
   std::vector<std::string> NamesIn(std::vector<std::string> const& command) {
     std::vector<std::string> arguments = command;
     arguments.push_back("--help");
-    std::string const help = Run(arguments).output;
+    std::string const help = Run(arguments).fOutput;
     std::string const title = "Subcommands:\n";
     std::size_t const start = help.find(title);
     if (start == help.npos) return {};
@@ -140,10 +140,10 @@ TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
 // Runs zep without privileges, because as root it would query the network.
 TEST_F(EnvelopeTest, WpadWithoutPermissionToListenPrintsADocument) {
   TCall call = {{"wpad", "--json", "--no-stop"}};
-  call.asNobody = true;
+  call.fAsNobody = true;
   TRun const run = fZep.Run(call);
-  EXPECT_EQ(run.status, 1);
-  ExpectEnvelope(run.output, 1, "zep wpad");
+  EXPECT_EQ(run.fStatus, 1);
+  ExpectEnvelope(run.fOutput, 1, "zep wpad");
 }
 
 // The commands that are missing here need a server or a device; tests/system checks their documents.
@@ -188,27 +188,27 @@ TEST_F(EnvelopeTest, WrongUsageOfEveryCommandPrintsADocument) {
 }
 
 TEST_F(EnvelopeTest, WithoutJsonOrAfterACommandToRunThereIsNoDocument) {
-  EXPECT_EQ(Run({"get", "ftp://127.0.0.1:1/f", "there"}).output, "");
-  EXPECT_EQ(Run({"run", "--no-such-option", "true", "--json"}).output, "");
-  EXPECT_EQ(Run({"run", "echo", "--json"}).output, "--json\n");
-  EXPECT_EQ(Run({"config", "--", "--json"}).output, "");
+  EXPECT_EQ(Run({"get", "ftp://127.0.0.1:1/f", "there"}).fOutput, "");
+  EXPECT_EQ(Run({"run", "--no-such-option", "true", "--json"}).fOutput, "");
+  EXPECT_EQ(Run({"run", "echo", "--json"}).fOutput, "--json\n");
+  EXPECT_EQ(Run({"config", "--", "--json"}).fOutput, "");
 }
 
 TEST_F(EnvelopeTest, EachHostOfAListHasItsOwnDocumentOnOneLine) {
   Write("password", "p\n");
   TRun const run = Run({"remote", "--hosts", "hosts", "--user", "u", "--password-file", "password"});
-  EXPECT_EQ(run.status, 1);
-  ASSERT_EQ(LinesOf(run.output).size(), 2u);
-  for (std::string const& line : LinesOf(run.output)) ExpectEnvelope(line, 1, "zep remote");
+  EXPECT_EQ(run.fStatus, 1);
+  ASSERT_EQ(LinesOf(run.fOutput).size(), 2u);
+  for (std::string const& line : LinesOf(run.fOutput)) ExpectEnvelope(line, 1, "zep remote");
   TRun const failed = Run({"remote", "--json", "--hosts", "/nowhere", "--user", "u"});
-  ASSERT_EQ(LinesOf(failed.output).size(), 1u);
+  ASSERT_EQ(LinesOf(failed.fOutput).size(), 1u);
 }
 
 TEST_F(EnvelopeTest, WhenAReportCannotBeSentTheFileThatKeepsItIsNamed) {
   TCall call = {{"report", "--json", "--sample", "--send", "ftp://127.0.0.1:1/d/"}};
-  call.environment = {{"TMPDIR", fZep.Path("work")}, {"NETRC", "/dev/null"}};
+  call.fEnvironment = {{"TMPDIR", fZep.Path("work")}, {"NETRC", "/dev/null"}};
   TRun const run = fZep.Run(call);
-  EXPECT_EQ(run.status, 68);
+  EXPECT_EQ(run.fStatus, 68);
   auto const document = JsonOf(run);
   EXPECT_EQ(document["status"], "complete");
   EXPECT_THAT(document["reason"].get<std::string>(), testing::StartsWith("the report was not sent: "));
@@ -220,14 +220,14 @@ TEST_F(EnvelopeTest, WhenAReportCannotBeSentTheFileThatKeepsItIsNamed) {
 
 TEST_F(EnvelopeTest, ADocumentThatCannotBeWrittenIsWrittenOnlyOnce) {
   TCall call = {{"config", "--json"}};
-  call.outputFile = "/dev/full";
+  call.fOutputFile = "/dev/full";
   TRun const run = fZep.Run(call);
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: standard output cannot be written: No space left on device\n");
-  call.arguments.push_back("--no-such-option");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: standard output cannot be written: No space left on device\n");
+  call.fArguments.push_back("--no-such-option");
   TRun const wrong = fZep.Run(call);
-  EXPECT_EQ(wrong.status, 64);
-  EXPECT_EQ(wrong.errors,
+  EXPECT_EQ(wrong.fStatus, 64);
+  EXPECT_EQ(wrong.fErrors,
             "zep: there is no option --no-such-option\nzep: standard output cannot be written: No space left on device\n");
 }
 

@@ -37,9 +37,9 @@ protected:
   std::string File() const { return fZep.Path("disks.mof"); }
   TRun Run(std::vector<std::string> const& arguments) {
     TCall call;
-    call.arguments = arguments;
-    call.environment = {{"ZEP_SMBIOS_TABLE", SamplePath()}, {"ZEP_HOST_NAME", "db1"}};
-    call.directory = fZep.Path("");
+    call.fArguments = arguments;
+    call.fEnvironment = {{"ZEP_SMBIOS_TABLE", SamplePath()}, {"ZEP_HOST_NAME", "db1"}};
+    call.fDirectory = fZep.Path("");
     return fZep.Run(call);
   }
 
@@ -50,8 +50,8 @@ protected:
 
 TEST_F(MofTest, ACorrectSchemaIsCounted) {
   TRun const run = Run({"mof", "disks.mof"});
-  EXPECT_EQ(run.status, 0) << run.errors;
-  EXPECT_EQ(run.output,
+  EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+  EXPECT_EQ(run.fOutput,
             "disks.mof\n"
             "\n"
             "Qualifier declarations    7\n"
@@ -77,37 +77,37 @@ TEST_F(MofTest, TheCountsAreAvailableAsJson) {
 
 TEST_F(MofTest, ThePrintedSchemaIsReadAndPrintedIdentically) {
   TRun const first = Run({"mof", "disks.mof", "--print"});
-  EXPECT_EQ(first.status, 0);
-  EXPECT_THAT(first.output,
+  EXPECT_EQ(first.fStatus, 0);
+  EXPECT_THAT(first.fOutput,
               testing::StartsWith("Qualifier Abstract : boolean = FALSE,\n    Scope(class, association, indication)"));
-  EXPECT_THAT(first.output, HasSubstr("[Association]\nclass X_Link {\n\n  [Key]\n  X_Device REF From;\n"));
-  WriteFile(fZep.Path("printed.mof"), first.output);
-  EXPECT_EQ(Run({"mof", "printed.mof", "--print"}).output, first.output);
+  EXPECT_THAT(first.fOutput, HasSubstr("[Association]\nclass X_Link {\n\n  [Key]\n  X_Device REF From;\n"));
+  WriteFile(fZep.Path("printed.mof"), first.fOutput);
+  EXPECT_EQ(Run({"mof", "printed.mof", "--print"}).fOutput, first.fOutput);
 }
 
 TEST_F(MofTest, AMistakeIsReportedWithItsPlace) {
   WriteFile(fZep.Path("bad.mof"), "class X_A {\n  strin Name;\n};\n");
   TRun const run = Run({"mof", "bad.mof"});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: bad.mof:2:9: expected \"REF\" after \"strin\", which is not a type, found \"Name\"\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fOutput, "");
+  EXPECT_EQ(run.fErrors, "zep: bad.mof:2:9: expected \"REF\" after \"strin\", which is not a type, found \"Name\"\n");
 
   WriteFile(fZep.Path("bad.mof"), "class \x1b[31m");
-  EXPECT_EQ(Run({"mof", "bad.mof"}).errors, "zep: bad.mof:1:7: unexpected character\n");
-  EXPECT_EQ(Run({"mof", "none.mof"}).errors, "zep: none.mof: cannot be read: No such file or directory\n");
-  EXPECT_EQ(Run({"mof", "none.mof"}).status, 1);
+  EXPECT_EQ(Run({"mof", "bad.mof"}).fErrors, "zep: bad.mof:1:7: unexpected character\n");
+  EXPECT_EQ(Run({"mof", "none.mof"}).fErrors, "zep: none.mof: cannot be read: No such file or directory\n");
+  EXPECT_EQ(Run({"mof", "none.mof"}).fStatus, 1);
 }
 
 TEST_F(MofTest, WrongUsageAndWrongSchemasHaveDifferentStatuses) {
-  EXPECT_EQ(Run({"mof"}).status, 64);
-  EXPECT_EQ(Run({"mof", "disks.mof", "--print", "--json"}).status, 64);
-  EXPECT_EQ(Run({"classes", "--mof"}).status, 64);
-  EXPECT_EQ(Run({"classes", "--sample", "--mof", "disks.mof"}).status, 64);
-  EXPECT_EQ(Run({"show", "--sample", "--mof", "disks.mof", "X_Disk"}).status, 64);
+  EXPECT_EQ(Run({"mof"}).fStatus, 64);
+  EXPECT_EQ(Run({"mof", "disks.mof", "--print", "--json"}).fStatus, 64);
+  EXPECT_EQ(Run({"classes", "--mof"}).fStatus, 64);
+  EXPECT_EQ(Run({"classes", "--sample", "--mof", "disks.mof"}).fStatus, 64);
+  EXPECT_EQ(Run({"show", "--sample", "--mof", "disks.mof", "X_Disk"}).fStatus, 64);
   for (char const* command : {"mof", "classes", "show"}) {
     TRun const help = Run({command, "--help"});
-    EXPECT_EQ(help.status, 0);
-    EXPECT_THAT(help.output, HasSubstr("Exit status: 0 when "));
+    EXPECT_EQ(help.fStatus, 0);
+    EXPECT_THAT(help.fOutput, HasSubstr("Exit status: 0 when "));
   }
 }
 
@@ -115,8 +115,8 @@ TEST_F(MofTest, WrongUsageAndWrongSchemasHaveDifferentStatuses) {
 
 TEST_F(MofTest, ClassesAreListed) {
   TRun const run = Run({"classes", "--mof", "disks.mof"});
-  EXPECT_EQ(run.status, 0);
-  EXPECT_EQ(run.output,
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_EQ(run.fOutput,
             "mof (disks.mof): 5 classes\n"
             "\n"
             "Class                                 Superclass                    Kind\n"
@@ -129,7 +129,7 @@ TEST_F(MofTest, ClassesAreListed) {
 }
 
 TEST_F(MofTest, ClassesAreATree) {
-  EXPECT_EQ(Run({"classes", "--tree", "--mof", "disks.mof"}).output,
+  EXPECT_EQ(Run({"classes", "--tree", "--mof", "disks.mof"}).fOutput,
             "mof (disks.mof): 5 classes\n"
             "\n"
             "X_Device (abstract)\n"
@@ -154,36 +154,36 @@ TEST_F(MofTest, ClassesAreAvailableAsJson) {
 
 TEST_F(MofTest, ClassesOfProvidersAreListed) {
   TRun const run = Run({"classes"});
-  EXPECT_EQ(run.status, 0);
-  EXPECT_THAT(run.output, testing::StartsWith("root/zep/host (Host): "));
-  EXPECT_THAT(run.output, HasSubstr("\nCIM_Chassis\n"));
-  EXPECT_THAT(Run({"classes", "--sample"}).output, testing::StartsWith("SAMPLE root/zep/host (Host): "));
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_THAT(run.fOutput, testing::StartsWith("root/zep/host (Host): "));
+  EXPECT_THAT(run.fOutput, HasSubstr("\nCIM_Chassis\n"));
+  EXPECT_THAT(Run({"classes", "--sample"}).fOutput, testing::StartsWith("SAMPLE root/zep/host (Host): "));
 }
 
 TEST_F(MofTest, WithAFailedPlugInTheListIsPartial) {
   fZep.Add("libBroken.nsp.so", File());
   TRun const run = Run({"classes"});
-  EXPECT_EQ(run.status, 2);
-  EXPECT_THAT(run.errors, HasSubstr("zep: Broken: "));
-  EXPECT_THAT(run.output, HasSubstr("\nCIM_Chassis\n"));
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_THAT(run.fErrors, HasSubstr("zep: Broken: "));
+  EXPECT_THAT(run.fOutput, HasSubstr("\nCIM_Chassis\n"));
   fZep.Remove("libHost.nsp.so");
-  EXPECT_EQ(Run({"classes"}).status, 1);
+  EXPECT_EQ(Run({"classes"}).fStatus, 1);
 }
 
 TEST_F(MofTest, ASchemaWithoutClassesIsAnError) {
   WriteFile(fZep.Path("empty.mof"), "// nothing\n");
   TRun const run = Run({"classes", "--mof", "empty.mof"});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: no class was found\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fOutput, "");
+  EXPECT_EQ(run.fErrors, "zep: no class was found\n");
 }
 
 // ---- zep show ----
 
 TEST_F(MofTest, AClassIsShownWithItsValuesInWordsAndItsMethods) {
   TRun const run = Run({"show", "X_Disk", "--mof", "disks.mof"});
-  EXPECT_EQ(run.status, 0);
-  EXPECT_EQ(run.output,
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_EQ(run.fOutput,
             "mof:X_Disk : X_Device\n"
             "\n"
             "A disk,\n"
@@ -210,7 +210,7 @@ TEST_F(MofTest, AClassIsShownWithItsValuesInWordsAndItsMethods) {
 }
 
 TEST_F(MofTest, AnInstanceIsShownWithItsValuesInWords) {
-  EXPECT_EQ(Run({"show", "mof:X_Disk.Id=\"2\"", "--mof", "disks.mof"}).output,
+  EXPECT_EQ(Run({"show", "mof:X_Disk.Id=\"2\"", "--mof", "disks.mof"}).fOutput,
             "mof:X_Disk.Id=\"2\"\n"
             "\n"
             "Property                  Type        Value\n"
@@ -223,8 +223,8 @@ TEST_F(MofTest, AnInstanceIsShownWithItsValuesInWords) {
 
 TEST_F(MofTest, AnUndeclaredObjectIsAnError) {
   TRun const run = Run({"show", "X_Tape", "--mof", "disks.mof"});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: disks.mof has no object \"X_Tape\"\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: disks.mof has no object \"X_Tape\"\n");
 }
 
 TEST_F(MofTest, AFailureIsAlsoPrintedAsADocument) {
@@ -234,8 +234,8 @@ TEST_F(MofTest, AFailureIsAlsoPrintedAsADocument) {
   for (auto const& call : calls) {
     SCOPED_TRACE(call.front());
     TRun const run = Run(call);
-    EXPECT_EQ(run.status, 1);
-    EXPECT_EQ(run.errors, "zep: " + why + "\n");
+    EXPECT_EQ(run.fStatus, 1);
+    EXPECT_EQ(run.fErrors, "zep: " + why + "\n");
     EXPECT_EQ(JsonOf(run), (nlohmann::json{{"document", "zep " + call.front()},
                                            {"version", 2},
                                            {"zep", TEST_VERSION},
@@ -263,23 +263,23 @@ TEST_F(MofTest, ThePageOnSchemasShowsTheActualOutput) {
   auto const blocks = ConsoleBlocks();
   ASSERT_EQ(blocks.size(), 2u);
   TCall call;
-  call.arguments = {"mof", "examples/Disks/disks.mof"};
-  call.directory = SourcePath();
-  EXPECT_EQ(blocks[0], "$ zep mof examples/Disks/disks.mof\n" + fZep.Run(call).output);
+  call.fArguments = {"mof", "examples/Disks/disks.mof"};
+  call.fDirectory = SourcePath();
+  EXPECT_EQ(blocks[0], "$ zep mof examples/Disks/disks.mof\n" + fZep.Run(call).fOutput);
 
   fZep.Add("libDisks.nsp.so", DISKS_PLUGIN);
   fZep.Add("disks.mof", SourcePath("examples/Disks/disks.mof"));
-  EXPECT_EQ(blocks[1], "$ zep show 'X_Disk.Name=\"sda\"'\n" + Run({"show", "X_Disk.Name=\"sda\""}).output);
+  EXPECT_EQ(blocks[1], "$ zep show 'X_Disk.Name=\"sda\"'\n" + Run({"show", "X_Disk.Name=\"sda\""}).fOutput);
 }
 
 TEST_F(MofTest, AProviderWhoseSchemaIsWrongIsReportedWithThePlace) {
   fZep.Add("libDisks.nsp.so", DISKS_PLUGIN);
   WriteFile(fZep.Path("lib/disks.mof"), "class X_Disk {");
   TRun const run = Run({"classes"});
-  EXPECT_EQ(run.status, 2);
-  EXPECT_THAT(run.errors, testing::StartsWith("zep: Disks: "));
-  EXPECT_THAT(run.errors, testing::EndsWith("/disks.mof:1:15: expected a type, a class and \"REF\", or \"}\", found the end of "
-                                            "the file (fill, libDisks.nsp.so)\n"));
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_THAT(run.fErrors, testing::StartsWith("zep: Disks: "));
+  EXPECT_THAT(run.fErrors, testing::EndsWith("/disks.mof:1:15: expected a type, a class and \"REF\", or \"}\", found the end of "
+                                             "the file (fill, libDisks.nsp.so)\n"));
 }
 
 // ---- The real schema ----
@@ -291,9 +291,9 @@ TEST_F(MofTest, TheRealSchemaIsCountedAndShown) {
   EXPECT_EQ(counts["classes"], 1631);
   EXPECT_EQ(counts["indications"], 24);
   TRun const tree = Run({"classes", "--tree", "--mof", schema.MainFile()});
-  EXPECT_THAT(tree.output, HasSubstr("\n                  CIM_VTOCDiskPartition\n"));  // nine levels below the root
+  EXPECT_THAT(tree.fOutput, HasSubstr("\n                  CIM_VTOCDiskPartition\n"));  // nine levels below the root
   TRun const shown = Run({"show", "CIM_ManagedSystemElement", "--mof", schema.MainFile()});
-  EXPECT_THAT(shown.output, HasSubstr("\nHealthState               0 (Unknown), 5 (OK), 10 (Degraded/Warning)"));
+  EXPECT_THAT(shown.fOutput, HasSubstr("\nHealthState               0 (Unknown), 5 (OK), 10 (Degraded/Warning)"));
 }
 
 }  // namespace

@@ -34,8 +34,8 @@ protected:
 
   TRun Run(std::vector<std::string> const& arguments) const {
     TCall call;
-    call.arguments = arguments;
-    call.environment = Environment();
+    call.fArguments = arguments;
+    call.fEnvironment = Environment();
     return fZep.Run(call);
   }
 
@@ -88,9 +88,9 @@ TEST_F(ProvidersTest, TheOutputIsThatOfPlugInsInTheProcessOfZep) {
     TRun const apart = Run(arguments);
     arguments.push_back("--in-process");
     TRun const inProcess = Run(arguments);
-    EXPECT_EQ(WithoutTimes(apart.output), WithoutTimes(inProcess.output));
-    EXPECT_FALSE(apart.output.empty());
-    EXPECT_EQ(apart.status, inProcess.status);
+    EXPECT_EQ(WithoutTimes(apart.fOutput), WithoutTimes(inProcess.fOutput));
+    EXPECT_FALSE(apart.fOutput.empty());
+    EXPECT_EQ(apart.fStatus, inProcess.fStatus);
   }
 }
 
@@ -116,7 +116,7 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
   for (TRow const& row : rows) Add({row.fName});
   Add({"ChangesDirectory", "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken"});
   TRun const run = Run({"report", "--json"});
-  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(run.fStatus, 2);
   auto const document = JsonOf(run);
   EXPECT_EQ(document["identity"]["serialNumber"]["value"], "KQ12345");
   for (TRow const& row : rows) {
@@ -135,15 +135,15 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
 TEST_F(ProvidersTest, TheRowOfAFailureNamesFileProviderStageCauseAndLogLine) {
   Add({"Crashes"});
   TRun const run = Run({"report"});
-  EXPECT_EQ(run.status, 2);
-  std::string const words = std::regex_replace(run.output, std::regex("\\s+"), " ");
+  EXPECT_EQ(run.fStatus, 2);
+  std::string const words = std::regex_replace(run.fOutput, std::regex("\\s+"), " ");
   EXPECT_THAT(words, HasSubstr("provider Crashes failed: it was ended by SIGSEGV (Segmentation fault) (fill, "
                                "libCrashes.nsp.so); last log line: [Error] about to crash"));
-  EXPECT_EQ(Run({"classes"}).status, 2);
-  EXPECT_EQ(Run({"classes"}).errors,
+  EXPECT_EQ(Run({"classes"}).fStatus, 2);
+  EXPECT_EQ(Run({"classes"}).fErrors,
             "zep: Crashes: it was ended by SIGSEGV (Segmentation fault) (fill, libCrashes.nsp.so); last "
             "log line: [Error] about to crash\n");
-  EXPECT_EQ(Run({"show", "CIM_Chassis"}).status, 0);
+  EXPECT_EQ(Run({"show", "CIM_Chassis"}).fStatus, 0);
 }
 
 TEST_F(ProvidersTest, PlugInsThatHangOrStopAreEndedAtTheTimeLimit) {
@@ -161,14 +161,14 @@ TEST_F(ProvidersTest, APlugInThatFillsMemoryIsEndedAtTheMemoryLimit) {
   if (kIsSanitized) GTEST_SKIP() << "a sanitizer reserves more address space than any limit";
   Add({"FillsMemory"});
   TRun const run = Run({"report", "--json", "--plugin-memory", "64"});
-  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(run.fStatus, 2);
   EXPECT_EQ(FailureIn(JsonOf(run), "FillsMemory")["error"], "std::bad_alloc (the memory limit is 64 MiB)");
 }
 
 TEST_F(ProvidersTest, AnEndlessAnswerIsCutOff) {
   Add({"AnswersForever"});
   TRun const run = Run({"report", "--json"});
-  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(run.fStatus, 2);
   EXPECT_EQ(FailureIn(JsonOf(run), "AnswersForever")["error"], "its answer exceeds 268435456 bytes");
 }
 
@@ -216,7 +216,7 @@ TEST_F(ProvidersTest, ProgressIsShownOnATerminalOnly) {
   std::string const dumb = OnTerminal(fZep.Path("bin/zep"), environment);
   EXPECT_THAT(dumb, HasSubstr("LoadHangs: static construction, "));
   EXPECT_EQ(dumb.find('\x1b'), dumb.npos);
-  EXPECT_THAT(Run({"classes", "--plugin-timeout", "2"}).errors, testing::Not(HasSubstr("LoadHangs: static construction")));
+  EXPECT_THAT(Run({"classes", "--plugin-timeout", "2"}).fErrors, testing::Not(HasSubstr("LoadHangs: static construction")));
 }
 
 }  // namespace

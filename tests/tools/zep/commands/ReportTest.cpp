@@ -84,10 +84,10 @@ protected:
   }
   TRun Run(std::vector<std::string> const& options, std::map<std::string, std::string> environment) {
     TCall call;
-    call.arguments = {"report"};
-    call.arguments.insert(call.arguments.end(), options.begin(), options.end());
-    call.environment = std::move(environment);
-    call.environment["ZEP_HOST_NAME"] = "db1";
+    call.fArguments = {"report"};
+    call.fArguments.insert(call.fArguments.end(), options.begin(), options.end());
+    call.fEnvironment = std::move(environment);
+    call.fEnvironment["ZEP_HOST_NAME"] = "db1";
     return fZep.Run(call);
   }
 
@@ -118,9 +118,9 @@ TEST_F(ReportTest, TheMachineOfEachRealTableIsReported) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.fTable);
     TRun const run = Report(RealTablePath(row.fTable));
-    EXPECT_EQ(run.status, row.fStatus);
-    EXPECT_EQ(run.errors, "");
-    auto const lines = LinesOf(run.output);
+    EXPECT_EQ(run.fStatus, row.fStatus);
+    EXPECT_EQ(run.fErrors, "");
+    auto const lines = LinesOf(run.fOutput);
     ASSERT_GT(lines.size(), 3u);
     EXPECT_EQ(lines[0], row.fMachine);
     EXPECT_THAT(lines[1], AllOf(StartsWith("Operating system: "), HasSubstr(", Linux ")));
@@ -153,15 +153,16 @@ TEST_F(ReportTest, EachRowHasItsValueOrItsReason) {
       {"no-serial", "Serial number", "unknown: not given by the firmware"},
       {"two-dashes", "Serial number", "KQ 99 (not in the collector's own form: 7 letters and digits)"},
   };
-  for (TRow const& row : rows) EXPECT_EQ(ValueIn(Report(RealTablePath(row.fTable)).output, row.fLabel), row.fValue) << row.fTable;
+  for (TRow const& row : rows)
+    EXPECT_EQ(ValueIn(Report(RealTablePath(row.fTable)).fOutput, row.fLabel), row.fValue) << row.fTable;
 }
 
 TEST_F(ReportTest, AProductNameWithoutModelIsReportedAsSuch) {
   TRun const run = Report(fZep.Table(SystemInformation("Server X1-[1234]-", "KQ12345") + EndOfTable()));
-  EXPECT_EQ(run.status, 2);
-  EXPECT_EQ(ValueIn(run.output, "Machine type"), "1234");
-  EXPECT_EQ(ValueIn(run.output, "Model"), "unknown: the product name contains only the machine type");
-  EXPECT_EQ(LinesOf(run.output)[0], "db1: Server X1, type 1234, model unknown, serial number KQ12345");
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_EQ(ValueIn(run.fOutput, "Machine type"), "1234");
+  EXPECT_EQ(ValueIn(run.fOutput, "Model"), "unknown: the product name contains only the machine type");
+  EXPECT_EQ(LinesOf(run.fOutput)[0], "db1: Server X1, type 1234, model unknown, serial number KQ12345");
 }
 
 // The forms of serial numbers that the firmware of many manufacturers uses; the texts are invented.
@@ -191,14 +192,14 @@ TEST_F(ReportTest, SerialNumbersOfAllManufacturersAreShownAndCompleteTheIdentity
     std::string const table = fZep.Table(SystemInformation(row.fProductName, row.fSerialNumber) + EndOfTable());
     std::string const note = "not in the collector's own form: 7 letters and digits";
     TRun const text = Report(table);
-    EXPECT_EQ(text.status, 0);
-    EXPECT_EQ(LinesOf(text.output)[0],
+    EXPECT_EQ(text.fStatus, 0);
+    EXPECT_EQ(LinesOf(text.fOutput)[0],
               "db1: " + row.fProductName + ", no machine type and model, serial number " + row.fShownSerialNumber);
-    EXPECT_EQ(WithoutBlanks(ValueIn(text.output, "Serial number")),
+    EXPECT_EQ(WithoutBlanks(ValueIn(text.fOutput, "Serial number")),
               WithoutBlanks(row.fShownSerialNumber + (row.fIsOfOwnForm ? "" : " (" + note + ")")));
 
     TRun const json = Report(table, {"--json"});
-    EXPECT_EQ(json.status, 0);
+    EXPECT_EQ(json.fStatus, 0);
     auto const document = JsonOf(json);
     EXPECT_EQ(document["status"], "complete");
     auto const& serialNumber = document["identity"]["serialNumber"];
@@ -216,8 +217,8 @@ TEST_F(ReportTest, SerialNumbersOfAllManufacturersAreShownAndCompleteTheIdentity
 
 TEST_F(ReportTest, ASerialNumberOfAnotherFormCompletesTheIdentity) {
   TRun const run = Report(fZep.Table(SystemInformation("Server Q100 -[1234AB7]-", "9000116105") + EndOfTable()));
-  EXPECT_EQ(run.status, 0);
-  EXPECT_EQ(LinesOf(run.output)[0], "db1: Server Q100, type 1234, model AB7, serial number 9000116105");
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_EQ(LinesOf(run.fOutput)[0], "db1: Server Q100, type 1234, model AB7, serial number 9000116105");
 }
 
 TEST_F(ReportTest, OnlyAProductNameWithoutBracketsHasNoTypeAndModel) {
@@ -238,7 +239,7 @@ TEST_F(ReportTest, OnlyAProductNameWithoutBracketsHasNoTypeAndModel) {
     SCOPED_TRACE(row.fProductName);
     std::string const table = fZep.Table(SystemInformation(row.fProductName, "KQ12345") + EndOfTable());
     TRun const run = Report(table, {"--json"});
-    EXPECT_EQ(run.status, row.fStatus);
+    EXPECT_EQ(run.fStatus, row.fStatus);
     auto const document = JsonOf(run);
     EXPECT_EQ(document["head"][0], "db1: " + std::string(row.fMachine) + ", serial number KQ12345");
     for (auto const& [key, code] : {std::pair("machineType", row.fTypeCode), std::pair("model", row.fModelCode)}) {
@@ -251,10 +252,10 @@ TEST_F(ReportTest, OnlyAProductNameWithoutBracketsHasNoTypeAndModel) {
 
 TEST_F(ReportTest, PlaceholdersOfTheFirmwareAreReportedAsSuch) {
   TRun const run = Report(fZep.Table(SystemInformation("To Be Filled By O.E.M.", "System Serial Number") + EndOfTable()));
-  EXPECT_EQ(run.status, 2);
-  EXPECT_EQ(ValueIn(run.output, "Product name"), "unknown: placeholder text of the firmware: \"To Be Filled By O.E.M.\"");
-  EXPECT_EQ(ValueIn(run.output, "Machine type"), "unknown: placeholder text of the firmware: \"To Be Filled By O.E.M.\"");
-  EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: placeholder text of the firmware: \"System Serial Number\"");
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_EQ(ValueIn(run.fOutput, "Product name"), "unknown: placeholder text of the firmware: \"To Be Filled By O.E.M.\"");
+  EXPECT_EQ(ValueIn(run.fOutput, "Machine type"), "unknown: placeholder text of the firmware: \"To Be Filled By O.E.M.\"");
+  EXPECT_EQ(ValueIn(run.fOutput, "Serial number"), "unknown: placeholder text of the firmware: \"System Serial Number\"");
 }
 
 TEST_F(ReportTest, ASerialNumberThatWasNeverWrittenIsMissing) {
@@ -267,7 +268,7 @@ TEST_F(ReportTest, ASerialNumberThatWasNeverWrittenIsMissing) {
   for (TRow const& row : rows) {
     std::string const table = fZep.Table(SystemInformation("Rackhost R5200", row.fSerialNumber) + EndOfTable());
     EXPECT_EQ(JsonOf(Report(table, {"--json"}))["identity"]["serialNumber"]["code"], row.fCode);
-    EXPECT_EQ(WithoutBlanks(ValueIn(Report(table).output, "Serial number")), WithoutBlanks(row.fShown));
+    EXPECT_EQ(WithoutBlanks(ValueIn(Report(table).fOutput, "Serial number")), WithoutBlanks(row.fShown));
   }
 }
 
@@ -279,20 +280,21 @@ TEST_F(ReportTest, TwoKindsOfProcessorAndModulesOfUnknownSizeAreDistinguished) {
   TRun const run = Report(fZep.Table(Structure(4, processor, {"Kind B"}) + Structure(4, processor, {"Kind A"}) +
                                      Structure(4, processor, {"Kind A"}) + Structure(17, module) + Structure(17, unknownModule) +
                                      EndOfTable()));
-  EXPECT_EQ(ValueIn(run.output, "Processors"), "2 x Kind A, 1 x Kind B");
-  EXPECT_EQ(ValueIn(run.output, "Memory"), "512 MiB in 2 modules, 1 of them of unknown size");
+  EXPECT_EQ(ValueIn(run.fOutput, "Processors"), "2 x Kind A, 1 x Kind B");
+  EXPECT_EQ(ValueIn(run.fOutput, "Memory"), "512 MiB in 2 modules, 1 of them of unknown size");
 }
 
 // ---- Reasons for missing tables ----
 
 TEST_F(ReportTest, AnUnreadableTableFileHasAReason) {
   TRun const missing = Report(fZep.Path("nothing"));
-  EXPECT_EQ(missing.status, 2);
-  EXPECT_EQ(LinesOf(missing.output)[0], "db1: not identified: the SMBIOS table file " + fZep.Path("nothing") + " does not exist");
+  EXPECT_EQ(missing.fStatus, 2);
+  EXPECT_EQ(LinesOf(missing.fOutput)[0],
+            "db1: not identified: the SMBIOS table file " + fZep.Path("nothing") + " does not exist");
 
   TRun const garbage = Report(fZep.Table("_SM_ and no more"));
-  EXPECT_EQ(garbage.status, 2);
-  EXPECT_THAT(LinesOf(garbage.output)[0], EndsWith(" does not contain an SMBIOS table"));
+  EXPECT_EQ(garbage.fStatus, 2);
+  EXPECT_THAT(LinesOf(garbage.fOutput)[0], EndsWith(" does not contain an SMBIOS table"));
 }
 
 TEST_F(ReportTest, ATableFileOfAnotherUserHasAReason) {
@@ -300,13 +302,13 @@ TEST_F(ReportTest, ATableFileOfAnotherUserHasAReason) {
   fs::permissions(table, fs::perms::owner_all);
   if (::geteuid() != 0) fs::permissions(table, fs::perms::none);
   TCall call;
-  call.arguments = {"report"};
-  call.environment = {{"ZEP_SMBIOS_TABLE", table}, {"ZEP_HOST_NAME", "db1"}};
-  call.asNobody = true;
+  call.fArguments = {"report"};
+  call.fEnvironment = {{"ZEP_SMBIOS_TABLE", table}, {"ZEP_HOST_NAME", "db1"}};
+  call.fAsNobody = true;
   TRun const run = fZep.Run(call);
-  EXPECT_EQ(run.status, 2);
-  ASSERT_FALSE(run.output.empty());
-  EXPECT_EQ(LinesOf(run.output)[0],
+  EXPECT_EQ(run.fStatus, 2);
+  ASSERT_FALSE(run.fOutput.empty());
+  EXPECT_EQ(LinesOf(run.fOutput)[0],
             "db1: not identified: the SMBIOS table file " + table + " cannot be read: this user lacks the permission");
 }
 
@@ -322,8 +324,8 @@ TEST_F(ReportTest, UnreadableSystemTablesHaveAReason) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.fBehaviour);
     TRun const run = Run({}, {{"FAKE_SMBIOS", row.fBehaviour}});
-    EXPECT_EQ(run.status, 2);
-    EXPECT_EQ(LinesOf(run.output)[0], row.fMachine);
+    EXPECT_EQ(run.fStatus, 2);
+    EXPECT_EQ(LinesOf(run.fOutput)[0], row.fMachine);
     auto const identity = JsonOf(Run({"--json"}, {{"FAKE_SMBIOS", row.fBehaviour}}))["identity"];
     for (char const* key : {"productName", "machineType", "model", "serialNumber"}) {
       EXPECT_EQ(identity[key]["code"], row.fCode) << key;
@@ -336,9 +338,9 @@ TEST_F(ReportTest, UnreadableSystemTablesHaveAReason) {
 TEST_F(ReportTest, WithoutTheSmbiosLibraryTheLinkersReasonIsReported) {
   fZep.Remove("libsmbios.so");
   TRun const run = Run({}, {});
-  EXPECT_EQ(run.status, 2);
-  EXPECT_THAT(LinesOf(run.output)[0], AllOf(StartsWith("db1: not identified: the SMBIOS library cannot be loaded: libsmbios.so"),
-                                            HasSubstr("No such file")));
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_THAT(LinesOf(run.fOutput)[0], AllOf(StartsWith("db1: not identified: the SMBIOS library cannot be loaded: libsmbios.so"),
+                                             HasSubstr("No such file")));
 }
 
 // ---- JSON ----
@@ -347,21 +349,21 @@ TEST_F(ReportTest, JsonAgreesWithTheText) {
   for (std::string const& table : kRealTables) {
     SCOPED_TRACE(table);
     TRun const text = Report(RealTablePath(table)), json = Report(RealTablePath(table), {"--json"});
-    EXPECT_EQ(json.status, text.status);
-    EXPECT_EQ(json.errors, "");
+    EXPECT_EQ(json.fStatus, text.fStatus);
+    EXPECT_EQ(json.fErrors, "");
     auto const document = JsonOf(json);
     EXPECT_EQ(document["version"], 2);
     EXPECT_EQ(document["document"], "zep report");
     EXPECT_EQ(document["sample"], false);
-    EXPECT_EQ(document["exitStatus"], text.status);
-    EXPECT_EQ(document["status"], text.status == 0 ? "complete" : "partial");
+    EXPECT_EQ(document["exitStatus"], text.fStatus);
+    EXPECT_EQ(document["status"], text.fStatus == 0 ? "complete" : "partial");
     EXPECT_EQ(document["smbiosTableFile"], RealTablePath(table));
-    EXPECT_EQ(document["head"][0], LinesOf(text.output)[0]);
-    EXPECT_EQ(document["head"][1], LinesOf(text.output)[1]);
+    EXPECT_EQ(document["head"][0], LinesOf(text.fOutput)[0]);
+    EXPECT_EQ(document["head"][1], LinesOf(text.fOutput)[1]);
 
     std::size_t compared = 0;
     for (auto const& [key, title] : std::map<std::string, std::string>{{"identity", "Identity"}, {"details", "Details"}}) {
-      auto const rows = ValueRowsOf(text.output, title);
+      auto const rows = ValueRowsOf(text.fOutput, title);
       ASSERT_EQ(rows.size(), document[key].size());
       for (auto const& entry : document[key]) {
         auto const row = std::find_if(rows.begin(), rows.end(), [&](auto const& cells) { return cells[0] == entry["label"]; });
@@ -422,20 +424,20 @@ TEST_F(ReportTest, JsonHasTheReasonForANullProperty) {
 
 TEST_F(ReportTest, TheSampleIsLabelledInEveryLineOfTheText) {
   TRun const run = fZep.Run({{"report", "--sample"}});
-  EXPECT_EQ(run.status, 0);
-  EXPECT_EQ(run.errors, "");
-  auto const lines = LinesOf(run.output);
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_EQ(run.fErrors, "");
+  auto const lines = LinesOf(run.fOutput);
   ASSERT_GT(lines.size(), 2u);
   EXPECT_EQ(lines[0], "SAMPLE sample-server: Server Q100, type 1234, model AB7, serial number KQ12345");
   EXPECT_THAT(lines[1], StartsWith("SAMPLE operating system of this machine, not of the sample: "));
   for (char const* title : {"SAMPLE Identity", "SAMPLE Details"}) {
-    auto const rows = ValueRowsOf(run.output, title);
+    auto const rows = ValueRowsOf(run.fOutput, title);
     EXPECT_FALSE(rows.empty()) << title;
     for (auto const& row : rows)
       EXPECT_TRUE(row[2].find("SAMPLE") == 0 || row[2].find("(not of the sample)") != std::string::npos)
           << row[0] << ": " << row[2];
   }
-  EXPECT_EQ(PlugInRowsOf(run.output, "SAMPLE Plug-in").size(), 1u);
+  EXPECT_EQ(PlugInRowsOf(run.fOutput, "SAMPLE Plug-in").size(), 1u);
 }
 
 TEST_F(ReportTest, TheSampleIsLabelledInJson) {
@@ -461,11 +463,11 @@ TEST_F(ReportTest, TheSampleHidesThisMachinesNameAndTheCallersTable) {
   char name[256] = {};
   ASSERT_EQ(::gethostname(name, sizeof name - 1), 0);
   TCall call;
-  call.arguments = {"report", "--sample", "--json"};
-  call.environment = {{"ZEP_SMBIOS_TABLE", RealTablePath("bare7")}, {"ZEP_HOST_NAME", "db1"}};
+  call.fArguments = {"report", "--sample", "--json"};
+  call.fEnvironment = {{"ZEP_SMBIOS_TABLE", RealTablePath("bare7")}, {"ZEP_HOST_NAME", "db1"}};
   TRun const run = fZep.Run(call);
-  EXPECT_THAT(run.output, Not(HasSubstr("\"" + std::string(name) + "\"")));
-  EXPECT_THAT(run.output, Not(HasSubstr("db1")));
+  EXPECT_THAT(run.fOutput, Not(HasSubstr("\"" + std::string(name) + "\"")));
+  EXPECT_THAT(run.fOutput, Not(HasSubstr("db1")));
   EXPECT_EQ(JsonOf(run)["identity"]["productName"]["value"], "Server Q100 -[1234AB7]-");
   EXPECT_TRUE(JsonOf(run)["smbiosTableFile"].is_null());
 }
@@ -473,9 +475,9 @@ TEST_F(ReportTest, TheSampleHidesThisMachinesNameAndTheCallersTable) {
 TEST_F(ReportTest, ASampleThatIsNotInstalledIsAnError) {
   fs::remove_all(fZep.Path("share"));
   TRun const run = fZep.Run({{"report", "--sample"}});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: the sample is not installed: " + fZep.Path("share/zepcore/sample/smbios.bin") + " is missing\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fOutput, "");
+  EXPECT_EQ(run.fErrors, "zep: the sample is not installed: " + fZep.Path("share/zepcore/sample/smbios.bin") + " is missing\n");
 }
 
 // ---- Plug-ins ----
@@ -483,20 +485,20 @@ TEST_F(ReportTest, ASampleThatIsNotInstalledIsAnError) {
 TEST_F(ReportTest, WithoutPlugInsNothingIsReported) {
   fZep.Remove("libHost.nsp.so");
   TRun const run = Report(RealTablePath("full"));
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(LinesOf(run.output)[0], "Unnamed machine: not identified: no provider plug-in found");
-  EXPECT_EQ(LinesOf(run.output)[1], "Operating system: unknown: no provider plug-in found");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(LinesOf(run.fOutput)[0], "Unnamed machine: not identified: no provider plug-in found");
+  EXPECT_EQ(LinesOf(run.fOutput)[1], "Operating system: unknown: no provider plug-in found");
   for (char const* title : {"Identity", "Details"})
-    for (auto const& row : ValueRowsOf(run.output, title)) {
+    for (auto const& row : ValueRowsOf(run.fOutput, title)) {
       EXPECT_EQ(row[1], "unknown: no provider plug-in found");
       EXPECT_EQ(row[2], "none");
     }
-  ASSERT_EQ(PlugInRowsOf(run.output).size(), 1u);
-  EXPECT_EQ(PlugInRowsOf(run.output)[0][0], "none");
-  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(run.output)[0][2]), WithoutBlanks("no file lib*.nsp.so in " + fZep.Path("lib")));
+  ASSERT_EQ(PlugInRowsOf(run.fOutput).size(), 1u);
+  EXPECT_EQ(PlugInRowsOf(run.fOutput)[0][0], "none");
+  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(run.fOutput)[0][2]), WithoutBlanks("no file lib*.nsp.so in " + fZep.Path("lib")));
 
   TRun const json = Report(RealTablePath("full"), {"--json"});
-  EXPECT_EQ(json.status, 1);
+  EXPECT_EQ(json.fStatus, 1);
   auto const document = JsonOf(json);
   EXPECT_EQ(document["status"], "nothing");
   EXPECT_THAT(document["plugIns"], IsEmpty());
@@ -507,10 +509,10 @@ TEST_F(ReportTest, WithoutPlugInsNothingIsReported) {
 TEST_F(ReportTest, ABrokenPlugInIsReportedWithTheLinkersReasonAndStopsNoOther) {
   WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
   TRun const run = Report(RealTablePath("full"));
-  EXPECT_EQ(run.status, 2);
-  EXPECT_EQ(run.errors, "");
-  EXPECT_EQ(LinesOf(run.output)[0], "db1: Server Q100, type 1234, model AB7, serial number KQ12345");
-  auto const rows = PlugInRowsOf(run.output);
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_EQ(run.fErrors, "");
+  EXPECT_EQ(LinesOf(run.fOutput)[0], "db1: Server Q100, type 1234, model AB7, serial number KQ12345");
+  auto const rows = PlugInRowsOf(run.fOutput);
   ASSERT_EQ(rows.size(), 2u);
   EXPECT_EQ(rows[0][0], "Broken");
   EXPECT_THAT(rows[0][1], testing::MatchesRegex("[0-9]+\\.[0-9] ms"));
@@ -529,8 +531,8 @@ TEST_F(ReportTest, ABrokenPlugInAloneReportsNothing) {
   fZep.Remove("libHost.nsp.so");
   WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
   TRun const run = Report(RealTablePath("full"));
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(LinesOf(run.output)[0], "Unnamed machine: not identified: no provider plug-in could be used");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(LinesOf(run.fOutput)[0], "Unnamed machine: not identified: no provider plug-in could be used");
 }
 
 TEST_F(ReportTest, AProviderThatFailsIsReportedAndStopsNoOther) {
@@ -545,9 +547,9 @@ TEST_F(ReportTest, AProviderThatFailsIsReportedAndStopsNoOther) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.fBehaviour);
     TRun const run = RunWithTestProvider(row.fBehaviour);
-    EXPECT_EQ(run.status, 2);
-    EXPECT_EQ(LinesOf(run.output)[0], "db1: Server Q100, type 1234, model AB7, serial number KQ12345");
-    auto const plugIns = PlugInRowsOf(run.output);
+    EXPECT_EQ(run.fStatus, 2);
+    EXPECT_EQ(LinesOf(run.fOutput)[0], "db1: Server Q100, type 1234, model AB7, serial number KQ12345");
+    auto const plugIns = PlugInRowsOf(run.fOutput);
     ASSERT_EQ(plugIns.size(), 2u);
     EXPECT_EQ(plugIns[1][0], "Test");
     EXPECT_EQ(WithoutBlanks(plugIns[1][2]), WithoutBlanks(std::string(row.fResult) + " (fill, libTest.nsp.so)"));
@@ -561,10 +563,10 @@ TEST_F(ReportTest, AProviderThatFailsIsReportedAndStopsNoOther) {
 
 TEST_F(ReportTest, TheReasonOfAFailureIsReported) {
   TRun const run = RunWithTestProvider("is-refused", {"--json"});
-  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(run.fStatus, 2);
   std::string const error = JsonOf(run)["plugIns"][1]["providers"][0]["error"];
   EXPECT_EQ(error, "kZEPStatusTypeMismatch (X_Refused.Kind refused: kZEPStatusTypeMismatch)");
-  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(RunWithTestProvider("is-refused").output)[1][2]),
+  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(RunWithTestProvider("is-refused").fOutput)[1][2]),
             WithoutBlanks("provider Test failed: " + error +
                           " (fill, libTest.nsp.so); last log line: [Error] X_Refused.Kind refused: kZEPStatusTypeMismatch"));
 }
@@ -572,8 +574,8 @@ TEST_F(ReportTest, TheReasonOfAFailureIsReported) {
 TEST_F(ReportTest, ANamespaceThatFailsLaterIsReportedWhereItFails) {
   fZep.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("fails-later", {"--in-process"});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: provider Test failed: kZEPStatusFail");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(ValueIn(run.fOutput, "Serial number"), "unknown: provider Test failed: kZEPStatusFail");
 
   auto const document = JsonOf(RunWithTestProvider("fails-later", {"--json", "--in-process"}));
   EXPECT_THAT(document["instances"], IsEmpty());
@@ -584,7 +586,7 @@ TEST_F(ReportTest, ANamespaceThatFailsLaterIsReportedWhereItFails) {
 TEST_F(ReportTest, ANamespaceWhoseClassesCannotBeReadIsReported) {
   fZep.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("fails-later", {"--json"});
-  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.fStatus, 1);
   auto const provider = JsonOf(run)["plugIns"][0]["providers"][0];
   EXPECT_EQ(provider["error"], "it threw something that is not a std::exception");
   EXPECT_EQ(provider["stage"], "fill");
@@ -592,15 +594,15 @@ TEST_F(ReportTest, ANamespaceWhoseClassesCannotBeReadIsReported) {
 
 TEST_F(ReportTest, APlugInThatRegistersNothingIsReported) {
   TRun const run = RunWithTestProvider("is-silent");
-  EXPECT_EQ(run.status, 0);
-  EXPECT_EQ(PlugInRowsOf(run.output)[1][2], "loaded, but registered no provider of its own");
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_EQ(PlugInRowsOf(run.fOutput)[1][2], "loaded, but registered no provider of its own");
 }
 
 TEST_F(ReportTest, TwoPlugInsThatRegisterOneNameAreBothNamed) {
   TRun const run = RunWithTestProvider("calls-itself-host");
-  EXPECT_EQ(run.status, 2);
-  EXPECT_EQ(PlugInRowsOf(run.output)[0][2], "filled root/zep/host");
-  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(run.output)[1][2]),
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_EQ(PlugInRowsOf(run.fOutput)[0][2], "filled root/zep/host");
+  EXPECT_EQ(WithoutBlanks(PlugInRowsOf(run.fOutput)[1][2]),
             WithoutBlanks("provider Host failed: the name Host is registered by libHost.nsp.so, which comes first (registration, "
                           "libTest.nsp.so)"));
 }
@@ -608,29 +610,29 @@ TEST_F(ReportTest, TwoPlugInsThatRegisterOneNameAreBothNamed) {
 TEST_F(ReportTest, OutputOfPlugInsStaysOutOfTheDocument) {
   TRun const run = RunWithTestProvider("prints", {"--json"});
   EXPECT_EQ(JsonOf(run)["plugIns"].size(), 2u);
-  EXPECT_THAT(run.output, StartsWith("{"));
-  EXPECT_EQ(run.errors, "zep: plug-in Test printed: noise while loading\nzep: plug-in Test printed: noise while filling\n");
+  EXPECT_THAT(run.fOutput, StartsWith("{"));
+  EXPECT_EQ(run.fErrors, "zep: plug-in Test printed: noise while loading\nzep: plug-in Test printed: noise while filling\n");
   EXPECT_EQ(JsonOf(run)["plugIns"][1]["words"], "noise while loading\nnoise while filling\n");
   TRun const inProcess = RunWithTestProvider("prints", {"--json", "--in-process"});
-  EXPECT_THAT(inProcess.output, StartsWith("{"));
-  EXPECT_THAT(inProcess.errors, AllOf(HasSubstr("noise while loading"), HasSubstr("noise while filling")));
+  EXPECT_THAT(inProcess.fOutput, StartsWith("{"));
+  EXPECT_THAT(inProcess.fErrors, AllOf(HasSubstr("noise while loading"), HasSubstr("noise while filling")));
 }
 
 TEST_F(ReportTest, TheFirstProviderThatKnowsAValueGivesIt) {
-  EXPECT_EQ(ValueIn(RunWithTestProvider("one-system").output, "Host name"), "db1");
+  EXPECT_EQ(ValueIn(RunWithTestProvider("one-system").fOutput, "Host name"), "db1");
   fZep.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("one-system");
-  EXPECT_EQ(run.status, 2);
-  EXPECT_EQ(LinesOf(run.output)[0], "one: 1234AB7, type 1234, model AB7, serial number KQ12345");
-  EXPECT_EQ(ValueRowsOf(run.output, "Identity")[0][2], "provider Test");
-  EXPECT_EQ(ValueIn(run.output, "OS"), "unknown: no provider describes it");
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_EQ(LinesOf(run.fOutput)[0], "one: 1234AB7, type 1234, model AB7, serial number KQ12345");
+  EXPECT_EQ(ValueRowsOf(run.fOutput, "Identity")[0][2], "provider Test");
+  EXPECT_EQ(ValueIn(run.fOutput, "OS"), "unknown: no provider describes it");
 }
 
 TEST_F(ReportTest, TwoSystemsAreNotOneIdentity) {
   fZep.Remove("libHost.nsp.so");
   TRun const run = RunWithTestProvider("two-systems");
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(ValueIn(run.output, "Serial number"), "unknown: the provider describes 2 instances");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(ValueIn(run.fOutput, "Serial number"), "unknown: the provider describes 2 instances");
 }
 
 // ---- Foreign bytes ----
@@ -641,14 +643,14 @@ TEST_F(ReportTest, FirmwareTextCannotControlTheTerminal) {
                                                          "31m\n\t") +
                                        EndOfTable());
   TRun const text = Report(table);
-  for (unsigned char c : text.output) EXPECT_TRUE(c == '\n' || (c >= 0x20 && c != 0x7f)) << static_cast<int>(c);
-  EXPECT_THAT(LinesOf(text.output)[0],
+  for (unsigned char c : text.fOutput) EXPECT_TRUE(c == '\n' || (c >= 0x20 && c != 0x7f)) << static_cast<int>(c);
+  EXPECT_THAT(LinesOf(text.fOutput)[0],
               StartsWith("db1: \\x1b]0;owned\\x07\\x1b[2J\\xff Q \xc3\xa9 \\u202e, type 1234, model AB7"));
 
   TRun const json = Report(table, {"--json"});
   EXPECT_EQ(JsonOf(json)["identity"]["productName"]["value"],
             "\x1b]0;owned\x07\x1b[2J\xef\xbf\xbd Q \xc3\xa9 \xe2\x80\xae -[1234AB7]-");
-  EXPECT_THAT(json.output, Not(HasSubstr("\x1b")));
+  EXPECT_THAT(json.fOutput, Not(HasSubstr("\x1b")));
 }
 
 TEST_F(ReportTest, OddValuesOfAProviderMakeOneValidDocument) {
@@ -678,7 +680,7 @@ TEST_F(ReportTest, TablesFitIntoEightyColumns) {
   WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
   for (TRun const& run : {Report(fZep.Table(SystemInformation(std::string(300, 'x'), std::string(200, 'y')) + EndOfTable())),
                           fZep.Run({{"report", "--sample"}}), Run({}, {})}) {
-    auto const lines = LinesOf(run.output);
+    auto const lines = LinesOf(run.fOutput);
     bool isTable = false;  // the head lines precede the first empty line
     for (std::string const& line : lines) {
       isTable = isTable || line.empty();
@@ -695,27 +697,27 @@ TEST_F(ReportTest, AClosedPipeEndsZepSilently) {
   ASSERT_EQ(::pipe(ends), 0);
   ::close(ends[0]);
   TCall call;
-  call.arguments = {"report", "--sample"};
-  call.outputDescriptor = ends[1];
+  call.fArguments = {"report", "--sample"};
+  call.fOutputDescriptor = ends[1];
   TRun const run = fZep.Run(call);
-  EXPECT_EQ(run.status, 128 + SIGPIPE);
-  EXPECT_EQ(run.errors, "");
+  EXPECT_EQ(run.fStatus, 128 + SIGPIPE);
+  EXPECT_EQ(run.fErrors, "");
 
-  call.ignoresBrokenPipes = true;
+  call.fIgnoresBrokenPipes = true;
   TRun const ignoring = fZep.Run(call);
-  EXPECT_EQ(ignoring.status, 1);
-  EXPECT_EQ(ignoring.errors, "zep: standard output cannot be written: Broken pipe\n");
+  EXPECT_EQ(ignoring.fStatus, 1);
+  EXPECT_EQ(ignoring.fErrors, "zep: standard output cannot be written: Broken pipe\n");
   ::close(ends[1]);
 }
 
 TEST_F(ReportTest, AFullDiskIsAnError) {
   if (!fs::exists("/dev/full")) GTEST_SKIP() << "/dev/full is missing";
   TCall call;
-  call.arguments = {"report", "--json", "--sample"};
-  call.outputFile = "/dev/full";
+  call.fArguments = {"report", "--json", "--sample"};
+  call.fOutputFile = "/dev/full";
   TRun const run = fZep.Run(call);
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: standard output cannot be written: No space left on device\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: standard output cannot be written: No space left on device\n");
 }
 
 // ---- Arguments ----
@@ -733,18 +735,18 @@ TEST_F(ReportTest, WrongUsageIsReportedOnStandardError) {
   for (auto const& arguments : calls) {
     SCOPED_TRACE(testing::PrintToString(arguments));
     TCall call;
-    call.arguments = arguments;
+    call.fArguments = arguments;
     TRun const run = fZep.Run(call);
-    EXPECT_EQ(run.status, 64);
-    EXPECT_EQ(run.output, "");
-    EXPECT_NE(run.errors, "");
+    EXPECT_EQ(run.fStatus, 64);
+    EXPECT_EQ(run.fOutput, "");
+    EXPECT_NE(run.fErrors, "");
   }
 }
 
 TEST_F(ReportTest, HelpAndVersionArePrinted) {
   TRun const version = fZep.Run({{"--version"}});
-  EXPECT_EQ(version.status, 0);
-  EXPECT_EQ(version.output, "zep " TEST_VERSION " (build " TEST_BUILD_ID ")\n");
+  EXPECT_EQ(version.fStatus, 0);
+  EXPECT_EQ(version.fOutput, "zep " TEST_VERSION " (build " TEST_BUILD_ID ")\n");
   struct TRow {
     std::vector<std::string> fArguments;
     std::vector<char const*> fWords;
@@ -757,11 +759,11 @@ TEST_F(ReportTest, HelpAndVersionArePrinted) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(testing::PrintToString(row.fArguments));
     TCall call;
-    call.arguments = row.fArguments;
+    call.fArguments = row.fArguments;
     TRun const run = fZep.Run(call);
-    EXPECT_EQ(run.status, 0);
-    EXPECT_EQ(run.errors, "");
-    for (char const* word : row.fWords) EXPECT_THAT(run.output, HasSubstr(word));
+    EXPECT_EQ(run.fStatus, 0);
+    EXPECT_EQ(run.fErrors, "");
+    for (char const* word : row.fWords) EXPECT_THAT(run.fOutput, HasSubstr(word));
   }
 }
 

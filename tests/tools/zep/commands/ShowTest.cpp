@@ -22,8 +22,8 @@ protected:
 
   TRun Run(std::vector<std::string> const& arguments, std::string const& behaviour = "odd") {
     TCall call;
-    call.arguments = arguments;
-    call.environment = {{"ZEP_SMBIOS_TABLE", SamplePath()}, {"ZEP_HOST_NAME", "db1"}, {"ZEP_TEST_PROVIDER", behaviour}};
+    call.fArguments = arguments;
+    call.fEnvironment = {{"ZEP_SMBIOS_TABLE", SamplePath()}, {"ZEP_HOST_NAME", "db1"}, {"ZEP_TEST_PROVIDER", behaviour}};
     return fZep.Run(call);
   }
 
@@ -35,8 +35,8 @@ TEST_F(ShowTest, EveryPathInAReportIsShown) {
   EXPECT_EQ(instances.size(), 20u);
   for (auto const& instance : instances) {
     TRun const run = Run({"show", instance["path"], "--json"});
-    EXPECT_EQ(run.status, 0) << instance["path"] << run.errors;
-    if (run.status != 0) continue;
+    EXPECT_EQ(run.fStatus, 0) << instance["path"] << run.fErrors;
+    if (run.fStatus != 0) continue;
     EXPECT_EQ(JsonOf(run)["object"], instance);
   }
 }
@@ -47,8 +47,8 @@ TEST_F(ShowTest, EveryPathNamesOneObject) {
   for (auto const& instance : instances) {
     paths.insert(instance["path"]);
     TRun const run = Run({"show", instance["path"], "--json"}, "hard-to-name");
-    EXPECT_EQ(run.status, 0) << instance["path"] << run.errors;
-    if (run.status != 0) continue;
+    EXPECT_EQ(run.fStatus, 0) << instance["path"] << run.fErrors;
+    if (run.fStatus != 0) continue;
     EXPECT_EQ(JsonOf(run)["object"], instance);
   }
   EXPECT_EQ(paths.size(), instances.size());
@@ -60,7 +60,7 @@ TEST_F(ShowTest, EveryPathNamesOneObject) {
 
 TEST_F(ShowTest, EveryPathInAListOfInstancesIsShown) {
   for (std::string const name : {"X_Note", "X_LateNote", "X_Plain", "X_Bytes", "X_ToBytes"}) {
-    std::string const text = Run({"show", name}, "hard-to-name").output;
+    std::string const text = Run({"show", name}, "hard-to-name").fOutput;
     auto const lines = LinesOf(text.substr(text.find("\nInstances\n") + 11));
     auto const listed = JsonOf(Run({"show", name, "--json"}, "hard-to-name"))["object"]["instances"];
     ASSERT_EQ(lines.size(), listed.size());
@@ -70,25 +70,25 @@ TEST_F(ShowTest, EveryPathInAListOfInstancesIsShown) {
 }
 
 TEST_F(ShowTest, AnInstanceWithoutKeysHasANumber) {
-  EXPECT_THAT(Run({"show", "X_Note#2"}, "hard-to-name").output,
+  EXPECT_THAT(Run({"show", "X_Note#2"}, "hard-to-name").fOutput,
               testing::AllOf(testing::StartsWith("root/test:X_Note#2\n\n"), HasSubstr("second\n")));
-  EXPECT_THAT(Run({"show", "X_Note"}, "hard-to-name").output,
+  EXPECT_THAT(Run({"show", "X_Note"}, "hard-to-name").fOutput,
               testing::EndsWith("\nInstances\nroot/test:X_Note#1\nroot/test:X_Note.Id=\"1\"\nroot/test:X_Note#2\n"
                                 "root/test:X_LateNote#1\n"));
   for (std::string const path : {"X_Note#3", "X_Note#0", "X_Note#", "X_Note#x", "X_LateNote#2", "X_None#1", "#1"})
-    EXPECT_EQ(Run({"show", path}, "hard-to-name").status, 1) << path;
+    EXPECT_EQ(Run({"show", path}, "hard-to-name").fStatus, 1) << path;
 }
 
 TEST_F(ShowTest, AReferenceIsShownAsAPathThatIsFound) {
   auto const object = JsonOf(Run({"show", "X_ToBytes.Id=\"1\"", "--json"}, "hard-to-name"))["object"];
   EXPECT_EQ(object["properties"]["Target"]["value"], "X_Bytes.Id=\"\\xfd\"");
-  EXPECT_EQ(Run({"show", object["properties"]["Target"]["value"]}, "hard-to-name").status, 0);
+  EXPECT_EQ(Run({"show", object["properties"]["Target"]["value"]}, "hard-to-name").fStatus, 0);
 }
 
 TEST_F(ShowTest, AnObjectIsShownWithTypesAndValues) {
   TRun const run = Run({"show", "root/zep/host:CIM_Chassis.CreationClassName=\"CIM_Chassis\",Tag=\"Chassis 0\""});
-  EXPECT_EQ(run.status, 0);
-  EXPECT_EQ(run.output,
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_EQ(run.fOutput,
             "root/zep/host:CIM_Chassis.CreationClassName=\"CIM_Chassis\",Tag=\"Chassis 0\"\n"
             "\n"
             "Property                  Type        Value\n"
@@ -107,28 +107,28 @@ TEST_F(ShowTest, AnObjectIsShownWithTypesAndValues) {
 }
 
 TEST_F(ShowTest, APathWithoutNamespaceIsSearchedInAllNamespaces) {
-  EXPECT_EQ(Run({"show", "CIM_Chassis.CreationClassName=\"CIM_Chassis\",Tag=\"Chassis 0\""}).status, 0);
-  EXPECT_EQ(Run({"show", "X_Link.Id=\"1\""}).status, 0);
+  EXPECT_EQ(Run({"show", "CIM_Chassis.CreationClassName=\"CIM_Chassis\",Tag=\"Chassis 0\""}).fStatus, 0);
+  EXPECT_EQ(Run({"show", "X_Link.Id=\"1\""}).fStatus, 0);
 }
 
 TEST_F(ShowTest, AMissingValueHasAReason) {
   TRun const run = Run({"show",
                         "CIM_Processor.CreationClassName=\"CIM_Processor\",DeviceID=\"Processor 0\","
                         "SystemCreationClassName=\"QRVSG_ComputerSystem\",SystemName=\"db1\""});
-  EXPECT_THAT(run.output, HasSubstr("UniqueID                  string      NULL: not set by the firmware (all zeros)\n"));
+  EXPECT_THAT(run.fOutput, HasSubstr("UniqueID                  string      NULL: not set by the firmware (all zeros)\n"));
 }
 
 TEST_F(ShowTest, AClassIsShownWithInheritedPropertiesAndItsInstances) {
   TRun const run = Run({"show", "X_Odd"});
-  EXPECT_EQ(run.status, 0);
-  EXPECT_THAT(run.output, testing::StartsWith("root/test:X_Odd : X_Base\n"
-                                              "\n"
-                                              "Property                  Type        Key    Default\n"
-                                              "Id                        string      key    NULL\n"
-                                              "Inherited                 uint8              NULL\n"
-                                              "Text                      string             NULL\n"));
-  EXPECT_THAT(run.output, HasSubstr("List                      string[]           NULL\n"));
-  EXPECT_THAT(run.output, HasSubstr("\nInstances\nroot/test:X_Odd.Id=\"quote \\\" and \\\\ and \\x1b[31m\"\n"));
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_THAT(run.fOutput, testing::StartsWith("root/test:X_Odd : X_Base\n"
+                                               "\n"
+                                               "Property                  Type        Key    Default\n"
+                                               "Id                        string      key    NULL\n"
+                                               "Inherited                 uint8              NULL\n"
+                                               "Text                      string             NULL\n"));
+  EXPECT_THAT(run.fOutput, HasSubstr("List                      string[]           NULL\n"));
+  EXPECT_THAT(run.fOutput, HasSubstr("\nInstances\nroot/test:X_Odd.Id=\"quote \\\" and \\\\ and \\x1b[31m\"\n"));
 
   auto const object = JsonOf(Run({"show", "root/test:X_Odd", "--json"}))["object"];
   EXPECT_EQ(object["class"], "X_Odd");
@@ -139,9 +139,9 @@ TEST_F(ShowTest, AClassIsShownWithInheritedPropertiesAndItsInstances) {
 
 TEST_F(ShowTest, AClassWithoutInstancesHasAReason) {
   TCall call;
-  call.arguments = {"show", "CIM_Chassis"};
-  call.environment = {{"ZEP_SMBIOS_TABLE", fZep.Path("nothing")}};
-  EXPECT_THAT(fZep.Run(call).output,
+  call.fArguments = {"show", "CIM_Chassis"};
+  call.fEnvironment = {{"ZEP_SMBIOS_TABLE", fZep.Path("nothing")}};
+  EXPECT_THAT(fZep.Run(call).fOutput,
               HasSubstr("\nInstances\nnone: the SMBIOS table file " + fZep.Path("nothing") + " does not exist\n"));
 }
 
@@ -156,9 +156,9 @@ TEST_F(ShowTest, AMissingObjectIsAnError) {
        {"CIM_Nothing", "root/zep/host:CIM_Nothing", "root/other:CIM_Chassis", "CIM_Chassis.Tag=\"Chassis 7\"",
         "CIM_Chassis.Nothing=\"1\"", "CIM_Chassis.Tag=", ":", "root/zep/host:", "\"", "CIM_Chassis.Tag=\"a"}) {
     TRun const run = Run({"show", path});
-    EXPECT_EQ(run.status, 1) << path;
-    EXPECT_EQ(run.output, "") << path;
-    EXPECT_EQ(run.errors, "zep: no provider has the object \"" + path + "\"\n");
+    EXPECT_EQ(run.fStatus, 1) << path;
+    EXPECT_EQ(run.fOutput, "") << path;
+    EXPECT_EQ(run.fErrors, "zep: no provider has the object \"" + path + "\"\n");
   }
 }
 
@@ -170,45 +170,45 @@ TEST_F(ShowTest, AnObjectWhoseKeysAreReferencesIsFoundByItsPrintedPath) {
                           [&](auto const& instance) { return instance["path"] == "root/clock:" + path; }));
   for (std::string const& given : {"root/clock:" + path, path}) {
     TRun const run = Run({"show", given, "--json"});
-    EXPECT_EQ(run.status, 0) << run.errors;
-    if (run.status != 0) continue;
+    EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+    if (run.fStatus != 0) continue;
     EXPECT_EQ(JsonOf(run)["object"]["path"], "root/clock:" + path);
     EXPECT_EQ(JsonOf(run)["object"]["properties"]["Leader"]["value"], "X_Clock.Name=\"realtime\"");
   }
-  EXPECT_EQ(Run({"show", "root/test:" + path}).status, 1);
-  EXPECT_EQ(Run({"show", "root/clock:X_RunsAtTheRateOf.Follower=\"X_Clock.Name=\"monotonic\"\""}).status, 1);
+  EXPECT_EQ(Run({"show", "root/test:" + path}).fStatus, 1);
+  EXPECT_EQ(Run({"show", "root/clock:X_RunsAtTheRateOf.Follower=\"X_Clock.Name=\"monotonic\"\""}).fStatus, 1);
 }
 
 TEST_F(ShowTest, AProviderThatFailedIsNamed) {
   std::string const nothing = "zep: no provider has the object \"X_Odd\"\n";
-  EXPECT_EQ(Run({"show", "X_Odd"}, "throws").errors, "zep: Test: kZEPStatusAccessDenied (fill, libTest.nsp.so)\n" + nothing);
-  EXPECT_EQ(Run({"show", "X_Odd"}, "fails-later").errors,
+  EXPECT_EQ(Run({"show", "X_Odd"}, "throws").fErrors, "zep: Test: kZEPStatusAccessDenied (fill, libTest.nsp.so)\n" + nothing);
+  EXPECT_EQ(Run({"show", "X_Odd"}, "fails-later").fErrors,
             "zep: Test: it threw something that is not a std::exception (fill, libTest.nsp.so)\n" + nothing);
-  EXPECT_EQ(Run({"show", "X_Odd", "--in-process"}, "fails-later").errors, "zep: Test: kZEPStatusFail\n" + nothing);
+  EXPECT_EQ(Run({"show", "X_Odd", "--in-process"}, "fails-later").fErrors, "zep: Test: kZEPStatusFail\n" + nothing);
   WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
-  EXPECT_EQ(Run({"show", "X_None"}).errors,
+  EXPECT_EQ(Run({"show", "X_None"}).fErrors,
             "zep: Broken: " + fZep.Path("bin/../lib/libBroken.nsp.so") +
                 ": file too short (open, libBroken.nsp.so)\nzep: no provider has the object \"X_None\"\n");
   TRun const run = Run({"show", "X_Odd"});
-  EXPECT_EQ(run.status, 0);
-  EXPECT_EQ(run.errors, "");
+  EXPECT_EQ(run.fStatus, 0);
+  EXPECT_EQ(run.fErrors, "");
 }
 
 TEST_F(ShowTest, ClassesNamesANamespaceThatFailsAndShowsTheOthers) {
   TRun const run = Run({"classes", "--json"}, "fails-later");
-  EXPECT_EQ(run.status, 2);
-  EXPECT_EQ(run.errors, "zep: Test: it threw something that is not a std::exception (fill, libTest.nsp.so)\n");
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_EQ(run.fErrors, "zep: Test: it threw something that is not a std::exception (fill, libTest.nsp.so)\n");
   EXPECT_EQ(JsonOf(run)["namespaces"].size(), 1u);
   TRun const inProcess = Run({"classes", "--json", "--in-process"}, "fails-later");
-  EXPECT_EQ(inProcess.status, 2);
-  EXPECT_EQ(inProcess.errors, "zep: Test: it threw something that is not a std::exception\n");
+  EXPECT_EQ(inProcess.fStatus, 2);
+  EXPECT_EQ(inProcess.fErrors, "zep: Test: it threw something that is not a std::exception\n");
   EXPECT_EQ(JsonOf(inProcess)["namespaces"].size(), 1u);
 }
 
 TEST_F(ShowTest, AMissingObjectHasADocument) {
   TRun const run = Run({"show", "X_None", "--json"});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: no provider has the object \"X_None\"\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: no provider has the object \"X_None\"\n");
   EXPECT_EQ(JsonOf(run)["document"], "zep show");
   EXPECT_EQ(JsonOf(run)["version"], 2);
   EXPECT_EQ(JsonOf(run)["exitStatus"], 1);
@@ -217,7 +217,7 @@ TEST_F(ShowTest, AMissingObjectHasADocument) {
 
 TEST_F(ShowTest, TheSampleIsLabelled) {
   TRun const run = Run({"show", "--sample", "CIM_Chassis"});
-  EXPECT_THAT(run.output, testing::StartsWith("SAMPLE root/zep/host:CIM_Chassis\n"));
+  EXPECT_THAT(run.fOutput, testing::StartsWith("SAMPLE root/zep/host:CIM_Chassis\n"));
   auto const document = JsonOf(Run({"show", "--sample", "--json", "CIM_Chassis"}));
   EXPECT_EQ(document["sample"], true);
   EXPECT_EQ(document["label"], "SAMPLE");

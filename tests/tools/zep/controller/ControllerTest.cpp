@@ -75,8 +75,8 @@ protected:
   TRun Run(std::vector<std::string> arguments, std::map<std::string, std::string> const& environment = {}) {
     arguments.insert(arguments.begin(), "remote");
     TCall call = {arguments};
-    call.environment = environment;
-    call.hasNoTerminal = true;
+    call.fEnvironment = environment;
+    call.fHasNoTerminal = true;
     return fZep.Run(call);
   }
 
@@ -100,13 +100,13 @@ std::string const kNothing =
 
 TEST_F(ZepRemoteTest, WithoutTheClientLibraryNothingIsReported) {
   TRun const run = Run({"192.0.2.1", "--user", "zepadmin"}, fPassword);
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.output,
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fOutput,
             "Remote server    192.0.2.1\nMachine type     unknown\nModel            unknown\nSerial number    unknown\n");
-  EXPECT_EQ(run.errors, "zep: 192.0.2.1: " + kNothing + "\n");
+  EXPECT_EQ(run.fErrors, "zep: 192.0.2.1: " + kNothing + "\n");
 
   TRun const json = Run({"192.0.2.1", "--user", "zepadmin", "--json"}, fPassword);
-  EXPECT_EQ(json.status, 1);
+  EXPECT_EQ(json.fStatus, 1);
   EXPECT_EQ(JsonOf(json)["document"], "zep remote");
   EXPECT_EQ(JsonOf(json)["host"], "192.0.2.1");
   EXPECT_TRUE(JsonOf(json)["type"].is_null());
@@ -116,10 +116,10 @@ TEST_F(ZepRemoteTest, WithoutTheClientLibraryNothingIsReported) {
 TEST_F(ZepRemoteTest, AListPrintsOneLineForEachHost) {
   std::string const hosts = File("hosts", "# the machine room\n\none\n  two \t\r\n::1\n#\none");
   TRun const run = Run({"--hosts", hosts, "--user", "zepadmin", "--parallel", "1"}, fPassword);
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: 4 of 4 hosts done, 4 failed\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: 4 of 4 hosts done, 4 failed\n");
   std::vector<std::string> names;
-  for (std::string const& line : LinesOf(run.output)) names.push_back(nlohmann::json::parse(line)["host"]);
+  for (std::string const& line : LinesOf(run.fOutput)) names.push_back(nlohmann::json::parse(line)["host"]);
   EXPECT_THAT(names, testing::ElementsAre("one", "two", "::1", "one"));
 }
 
@@ -139,18 +139,18 @@ TEST_F(ZepRemoteTest, WrongUsageHasItsOwnStatus) {
   for (auto const& call : calls) {
     SCOPED_TRACE(testing::PrintToString(call));
     TRun const run = Run(call, fPassword);
-    EXPECT_EQ(run.status, 64);
-    EXPECT_EQ(run.output, "");
-    EXPECT_NE(run.errors, "");
+    EXPECT_EQ(run.fStatus, 64);
+    EXPECT_EQ(run.fOutput, "");
+    EXPECT_NE(run.fErrors, "");
   }
 }
 
 TEST_F(ZepRemoteTest, AFileOfHostsThatCannotBeUsedIsReported) {
   std::string const absent = fZep.Path("absent"), empty = File("empty", "\n# nothing\n \n");
   TRun const without = Run({"--hosts", absent, "--user", "u"}, fPassword);
-  EXPECT_EQ(without.status, 1);
-  EXPECT_EQ(without.errors, "zep: " + absent + " cannot be read: No such file or directory\n");
-  EXPECT_EQ(Run({"--hosts", empty, "--user", "u"}, fPassword).errors, "zep: " + empty + " contains no host\n");
+  EXPECT_EQ(without.fStatus, 1);
+  EXPECT_EQ(without.fErrors, "zep: " + absent + " cannot be read: No such file or directory\n");
+  EXPECT_EQ(Run({"--hosts", empty, "--user", "u"}, fPassword).fErrors, "zep: " + empty + " contains no host\n");
 }
 
 TEST_F(ZepRemoteTest, AReadErrorInTheFileOfHostsIsNotTheEndOfTheFile) {
@@ -159,36 +159,36 @@ TEST_F(ZepRemoteTest, AReadErrorInTheFileOfHostsIsNotTheEndOfTheFile) {
   };
   for (TRow const& row : {TRow{fZep.Path("lib"), "Is a directory"}, TRow{"/proc/self/mem", "Input/output error"}}) {
     TRun const run = Run({"--hosts", row.fPath, "--user", "u"}, fPassword);
-    EXPECT_EQ(run.status, 1);
-    EXPECT_EQ(run.output, "");
-    EXPECT_EQ(run.errors, "zep: " + row.fPath + " cannot be read: " + row.fReason + "\n");
+    EXPECT_EQ(run.fStatus, 1);
+    EXPECT_EQ(run.fOutput, "");
+    EXPECT_EQ(run.fErrors, "zep: " + row.fPath + " cannot be read: " + row.fReason + "\n");
   }
 }
 
 TEST_F(ZepRemoteTest, WithoutATerminalThePasswordNeedsAnotherSource) {
   TRun const run = Run({"host", "--user", "u"});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: there is no terminal to ask for the password: set ZEP_BMC_PASSWORD or use --password-file\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: there is no terminal to ask for the password: set ZEP_BMC_PASSWORD or use --password-file\n");
   std::string const absent = fZep.Path("absent");
-  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", absent}, fPassword).errors,
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", absent}, fPassword).fErrors,
             "zep: the file of --password-file cannot be read: No such file or directory\n");
-  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", fZep.Path("lib")}, fPassword).errors,
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", fZep.Path("lib")}, fPassword).fErrors,
             "zep: " + fZep.Path("lib") + " cannot be read: Is a directory\n");
   std::string const empty = File("empty", "");
-  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", empty}, fPassword).errors,
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", empty}, fPassword).fErrors,
             "zep: there is no password in " + empty + "\n");
-  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", Private(File("password", "zeppass1\n"))}).errors,
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", Private(File("password", "zeppass1\n"))}).fErrors,
             "zep: host: " + kNothing + "\n");
-  EXPECT_EQ(Run({"host", "--user", "u"}, {{"ZEP_BMC_PASSWORD", ""}}).errors, "zep: host: " + kNothing + "\n")
+  EXPECT_EQ(Run({"host", "--user", "u"}, {{"ZEP_BMC_PASSWORD", ""}}).fErrors, "zep: host: " + kNothing + "\n")
       << "an empty password is a password";
 }
 
 TEST_F(ZepRemoteTest, ADebugLogContainsNoPassword) {
   std::string const log = fZep.Path("log");
   TRun const run = Run({"host", "--user", "u", "--debug-log", log}, fPassword);
-  EXPECT_EQ(run.errors, "zep: host: " + kNothing + "\n") << "the debug log needs no warning";
+  EXPECT_EQ(run.fErrors, "zep: host: " + kNothing + "\n") << "the debug log needs no warning";
   EXPECT_THAT(ReadFile(log), HasSubstr("FDR_[Debug] "));
-  EXPECT_EQ((run.errors + run.output + ReadFile(log)).find("zeppass1"), std::string::npos);
+  EXPECT_EQ((run.fErrors + run.fOutput + ReadFile(log)).find("zeppass1"), std::string::npos);
 }
 
 TEST_F(ZepRemoteTest, ADebugLogIsReadableOnlyByItsOwner) {
@@ -212,8 +212,8 @@ TEST_F(ZepRemoteTest, ADebugLogMustBeARegularFileOfTheCaller) {
   for (TRow const& row : {TRow{link, "it is a symbolic link"}, TRow{fZep.Path("second"), "it has several names (hard links)"},
                           TRow{fifo, "it is not a regular file"}, TRow{"/dev/null", "it is not a regular file"}}) {
     TRun const run = Run({"host", "--user", "u", "--debug-log", row.fLog}, fPassword);
-    EXPECT_EQ(run.status, 1);
-    EXPECT_EQ(run.errors, "zep: the debug log " + row.fLog + " cannot be written: " + row.fReason + "\n");
+    EXPECT_EQ(run.fStatus, 1);
+    EXPECT_EQ(run.fErrors, "zep: the debug log " + row.fLog + " cannot be written: " + row.fReason + "\n");
   }
   EXPECT_EQ(ReadFile(victim), "untouched");
 }
@@ -222,7 +222,7 @@ TEST_F(ZepRemoteTest, AFileOfAnotherUserIsRefusedAsDebugLog) {
   NEEDS(::geteuid() == 0, "root, who may write another user's file");
   std::string const log = File("log", "untouched");
   ASSERT_EQ(::chown(log.c_str(), 65534, 65534), 0);
-  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", log}, fPassword).errors,
+  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", log}, fPassword).fErrors,
             "zep: the debug log " + log + " cannot be written: it belongs to another user\n");
   EXPECT_EQ(ReadFile(log), "untouched");
 }
@@ -231,21 +231,21 @@ TEST_F(ZepRemoteTest, APasswordFileReadableByEveryUserCausesAWarning) {
   std::string const file = File("password", "zeppass1\n");
   fs::permissions(file, static_cast<fs::perms>(0644));
   TRun const run = Run({"host", "--user", "u", "--password-file", file});
-  EXPECT_EQ(run.errors, "zep: warning: every user may read the passwords in " + file +
-                            " (mode 0644); chmod 600 makes it private\nzep: host: " + kNothing + "\n");
+  EXPECT_EQ(run.fErrors, "zep: warning: every user may read the passwords in " + file +
+                             " (mode 0644); chmod 600 makes it private\nzep: host: " + kNothing + "\n");
   fs::permissions(file, static_cast<fs::perms>(0640));
-  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", file}).errors, "zep: host: " + kNothing + "\n");
+  EXPECT_EQ(Run({"host", "--user", "u", "--password-file", file}).fErrors, "zep: host: " + kNothing + "\n");
 }
 
 TEST_F(ZepRemoteTest, AHostWithAPasswordIsNotQueried) {
   TRun const run = Run({"admin:topsecret@host", "--user", "u", "--json"}, fPassword);
-  EXPECT_EQ(run.status, 64);
-  EXPECT_THAT(run.errors, HasSubstr("zep: the host is not a host name or address; "));
+  EXPECT_EQ(run.fStatus, 64);
+  EXPECT_THAT(run.fErrors, HasSubstr("zep: the host is not a host name or address; "));
   TRun const list = Run({"--hosts", File("hosts", "admin:topsecret@host\n"), "--user", "u"}, fPassword);
-  EXPECT_EQ(list.status, 1);
-  EXPECT_THAT(list.output, HasSubstr("line 1 of "));
-  EXPECT_THAT(list.output, HasSubstr("not a host name or address; "));
-  EXPECT_THAT(list.output + list.errors, Not(HasSubstr("topsecret")));
+  EXPECT_EQ(list.fStatus, 1);
+  EXPECT_THAT(list.fOutput, HasSubstr("line 1 of "));
+  EXPECT_THAT(list.fOutput, HasSubstr("not a host name or address; "));
+  EXPECT_THAT(list.fOutput + list.fErrors, Not(HasSubstr("topsecret")));
 }
 
 // ---- The password of a running process ----
@@ -323,10 +323,10 @@ TEST_F(ZepSecretProcessTest, AnotherProcessOfTheSameUserCannotInspectIt) {
 TEST_F(ZepRemoteTest, ADebugLogThatCannotBeWrittenIsReported) {
   std::string const nowhere = fZep.Path("none/log");
   TRun const run = Run({"host", "--user", "u", "--debug-log", nowhere}, fPassword);
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: the debug log " + nowhere + " cannot be written: No such file or directory\n");
-  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", fZep.Path("lib")}, fPassword).errors,
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fOutput, "");
+  EXPECT_EQ(run.fErrors, "zep: the debug log " + nowhere + " cannot be written: No such file or directory\n");
+  EXPECT_EQ(Run({"host", "--user", "u", "--debug-log", fZep.Path("lib")}, fPassword).fErrors,
             "zep: the debug log " + fZep.Path("lib") + " cannot be written: Is a directory\n");
 }
 
@@ -357,11 +357,11 @@ TEST_F(ZepRemoteTest, EachErrorOfTheClientLibraryHasItsReason) {
     auto environment = fPassword;
     environment["FAKE_IPMI_CODE"] = row.fCode;
     TRun const run = Run({"host", "--user", "u"}, environment);
-    EXPECT_EQ(run.status, 1);
-    EXPECT_EQ(run.errors, "zep: host: no session with the controller after N s: "s + row.fWords + "\n");
+    EXPECT_EQ(run.fStatus, 1);
+    EXPECT_EQ(run.fErrors, "zep: host: no session with the controller after N s: "s + row.fWords + "\n");
     TRun const logged = Run({"host", "--user", "u", "--debug-log", log}, environment);
-    EXPECT_THAT(logged.errors, testing::EndsWith(run.errors));
-    EXPECT_EQ((logged.output + logged.errors + ReadFile(log)).find("zeppass1"), std::string::npos);
+    EXPECT_THAT(logged.fErrors, testing::EndsWith(run.fErrors));
+    EXPECT_EQ((logged.fOutput + logged.fErrors + ReadFile(log)).find("zeppass1"), std::string::npos);
   }
 }
 
@@ -370,12 +370,12 @@ TEST_F(ZepRemoteTest, UserAndPasswordAreNotMistakenForACode) {
   fZep.Add("libipmiClient.so", FAKE_IPMI_CLIENT);
   std::string const forged = "x\nFDR_[Debug] 1/1/2026  0:0:0 Connection Error code:3\n";
   TRun const run = Run({"host", "--user", forged}, {{"ZEP_BMC_PASSWORD", forged}, {"FAKE_IPMI_CODE", "1"}});
-  EXPECT_THAT(run.errors, testing::EndsWith(": wrong password\n"));
+  EXPECT_THAT(run.fErrors, testing::EndsWith(": wrong password\n"));
 }
 
 TEST_F(ZepRemoteTest, AClientLibraryThatLacksAFunctionIsReported) {
   fZep.Add("libipmiClient.so", TEST_LIB_DIR "/libsmbios.so");
-  EXPECT_EQ(Run({"host", "--user", "u"}, fPassword).errors,
+  EXPECT_EQ(Run({"host", "--user", "u"}, fPassword).fErrors,
             "zep: host: no session with the controller after N s: libipmiClient.so cannot be used: the function OpenConnection "
             "is missing\n");
 }
@@ -385,7 +385,7 @@ TEST_F(ZepRemoteTest, ASessionWithoutAnswersIsReported) {
   auto environment = fPassword;
   environment["FAKE_IPMI_CODE"] = "0";
   TRun const run = Run({"host", "--user", "u", "--json"}, environment);
-  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.fStatus, 1);
   EXPECT_EQ(JsonOf(run)["error"], "the controller did not report everything");
 }
 

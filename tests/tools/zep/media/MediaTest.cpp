@@ -222,8 +222,8 @@ TEST_F(MediaCommandTest, ListsMediaAsATable) {
   NEEDS(::geteuid() == 0, "zep runs blkid only as root");
   for (std::vector<std::string> const& arguments : {std::vector<std::string>{}, std::vector<std::string>{"list"}}) {
     TRun const run = Run(arguments);
-    EXPECT_EQ(run.status, 0) << run.errors;
-    EXPECT_EQ(run.output,
+    EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+    EXPECT_EQ(run.fOutput,
               "Device        Size       Label        File system  Mounted at    Description\n"
               "/dev/fd0      -          -            -            -             -\n"
               "/dev/sdb1     7 MiB      STICK        vfat         -             QEMU HARDDISK\n"
@@ -249,7 +249,7 @@ TEST_F(MediaCommandTest, TheTableShowsSizesAndMountPoints) {
             row.fSize + R"(,"mountpoints":["/mnt/key","/media/a"]})";
   AddStandIn("lsblk", "echo '{\"blockdevices\":[" + list + "]}'");
   AddStandIn("blkid", "exit 2");
-  std::vector<std::string> const lines = LinesOf(Run({}).output);
+  std::vector<std::string> const lines = LinesOf(Run({}).fOutput);
   ASSERT_EQ(lines.size(), 1 + 2 * std::size(rows));
   for (std::size_t i = 0; i < std::size(rows); ++i) {
     std::string const size = rows[i].fShown + std::string(11 - rows[i].fShown.size(), ' ');
@@ -266,7 +266,7 @@ TEST_F(MediaCommandTest, ListsMediaAsJson) {
   AddStandIn("blkid", "exit 2");
   for (std::vector<std::string> const& arguments : {std::vector<std::string>{"--json"}, {"list", "--json"}, {"--json", "list"}}) {
     TRun const run = Run(arguments);
-    EXPECT_EQ(run.status, 0) << run.errors;
+    EXPECT_EQ(run.fStatus, 0) << run.fErrors;
     EXPECT_EQ(JsonOf(run)["document"], "zep media");
     EXPECT_EQ(JsonOf(run)["media"], nlohmann::json::parse(R"([{"device":"/dev/sdb","description":"Key","size":8053063680,
       "label":"KEY","fileSystem":"vfat","readOnly":false,"mounted":true,"mountPoints":["/mnt/key"]}])"));
@@ -276,25 +276,25 @@ TEST_F(MediaCommandTest, ListsMediaAsJson) {
 TEST_F(MediaCommandTest, WithoutMediaTheStatusIsOne) {
   AddStandIn("lsblk", "echo '{\"blockdevices\":[]}'");
   TRun const run = Run({});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.output, "");
-  EXPECT_EQ(run.errors, "zep: no removable medium was found\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fOutput, "");
+  EXPECT_EQ(run.fErrors, "zep: no removable medium was found\n");
   TRun const asJson = Run({"--json"});
-  EXPECT_EQ(asJson.status, 1);
+  EXPECT_EQ(asJson.fStatus, 1);
   EXPECT_THAT(JsonOf(asJson)["media"], IsEmpty());
 }
 
 TEST_F(MediaCommandTest, AFailureOfLsblkIsReported) {
   AddStandIn("lsblk", "echo 'lsblk: no sysfs' >&2; exit 1");
   TRun run = Run({});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: lsblk failed: lsblk: no sysfs\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: lsblk failed: lsblk: no sysfs\n");
   AddStandIn("lsblk", "exit 1");
-  EXPECT_EQ(Run({}).errors, "zep: lsblk is missing, or failed without a message; it is in the package util-linux\n");
+  EXPECT_EQ(Run({}).fErrors, "zep: lsblk is missing, or failed without a message; it is in the package util-linux\n");
   AddStandIn("lsblk", "echo usage");
   run = Run({});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_THAT(run.errors, StartsWith("zep: lsblk did not print its list as JSON, but: usage"));
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_THAT(run.fErrors, StartsWith("zep: lsblk did not print its list as JSON, but: usage"));
 }
 
 TEST_F(MediaCommandTest, UnreadableLabelsAreReported) {
@@ -302,8 +302,8 @@ TEST_F(MediaCommandTest, UnreadableLabelsAreReported) {
   AddStandIn("lsblk", "cat " + TestDataPath("lsblk/devices.json"));
   AddStandIn("blkid", "echo LABEL=never read");
   TRun const run = Run({"--json"}, true);
-  EXPECT_EQ(run.status, 2);
-  EXPECT_EQ(run.errors, "zep: only root can read labels and file systems\n");
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_EQ(run.fErrors, "zep: only root can read labels and file systems\n");
   EXPECT_EQ(JsonOf(run)["labelsReadable"], false);
   EXPECT_EQ(JsonOf(run)["media"][1]["label"], nullptr);
 }
@@ -335,9 +335,9 @@ TEST_F(MediaCommandTest, InvalidNamesAreRefusedBeforeAnyProgramRuns) {
   for (TRow const& row : rows) {
     SCOPED_TRACE(testing::PrintToString(row.fArguments));
     TRun const run = Run(row.fArguments);
-    EXPECT_EQ(run.status, row.fStatus);
-    EXPECT_THAT(run.errors, StartsWith(row.fErrors));
-    EXPECT_EQ(run.output, "");
+    EXPECT_EQ(run.fStatus, row.fStatus);
+    EXPECT_THAT(run.fErrors, StartsWith(row.fErrors));
+    EXPECT_EQ(run.fOutput, "");
   }
   EXPECT_FALSE(fs::exists(fInstallation.Path("run")));
 }
@@ -345,13 +345,13 @@ TEST_F(MediaCommandTest, InvalidNamesAreRefusedBeforeAnyProgramRuns) {
 TEST_F(MediaCommandTest, AReportIsWrittenOnlyToADeviceName) {
   for (char const* name : {"/tmp", "/dev/sdb;x", "key"}) {
     TRun const run = fInstallation.Run({{"report", "--sample", "--to-media", name}});
-    EXPECT_EQ(run.status, 64) << name;
-    EXPECT_THAT(run.errors, HasSubstr("is not a device name"));
-    EXPECT_EQ(run.output, "");
+    EXPECT_EQ(run.fStatus, 64) << name;
+    EXPECT_THAT(run.fErrors, HasSubstr("is not a device name"));
+    EXPECT_EQ(run.fOutput, "");
   }
   TRun const run = fInstallation.Run({{"report", "--sample", "--to-media", "/dev/no-such-device"}});
-  EXPECT_EQ(run.status, 1);
-  EXPECT_EQ(run.errors, "zep: the device /dev/no-such-device does not exist\n");
+  EXPECT_EQ(run.fStatus, 1);
+  EXPECT_EQ(run.fErrors, "zep: the device /dev/no-such-device does not exist\n");
 }
 
 }  // namespace

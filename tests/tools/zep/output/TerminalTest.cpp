@@ -91,7 +91,7 @@ TEST_F(AtTerminalTest, NoWordIsTruncated) {
     std::string const shown = Shown({"show", "CIM_PhysicalMemory", "--sample"}, columns);
     EXPECT_THAT(shown, HasSubstr("\nConfiguredMemoryClockSpeed ")) << columns;
   }
-  EXPECT_THAT(fZep.Run({{"show", "CIM_PhysicalMemory", "--sample"}}).output, HasSubstr("\nConfiguredMemoryClockSpeed "));
+  EXPECT_THAT(fZep.Run({{"show", "CIM_PhysicalMemory", "--sample"}}).fOutput, HasSubstr("\nConfiguredMemoryClockSpeed "));
 }
 
 TEST_F(AtTerminalTest, ADumbTerminalGetsPlainLines) {
@@ -114,12 +114,12 @@ TEST_F(AtTerminalTest, AListOfHostsShowsItsProgressInPlainLines) {
 }
 
 TEST_F(AtTerminalTest, HelpIsAlsoACommand) {
-  EXPECT_EQ(fZep.Run({{"help"}}).output, fZep.Run({{"--help"}}).output);
-  EXPECT_EQ(fZep.Run({{"help", "report"}}).output, fZep.Run({{"report", "--help"}}).output);
-  EXPECT_EQ(fZep.Run({{"help", "media", "mount"}}).output, fZep.Run({{"media", "mount", "--help"}}).output);
+  EXPECT_EQ(fZep.Run({{"help"}}).fOutput, fZep.Run({{"--help"}}).fOutput);
+  EXPECT_EQ(fZep.Run({{"help", "report"}}).fOutput, fZep.Run({{"report", "--help"}}).fOutput);
+  EXPECT_EQ(fZep.Run({{"help", "media", "mount"}}).fOutput, fZep.Run({{"media", "mount", "--help"}}).fOutput);
   TRun const wrong = fZep.Run({{"help", "bogus"}});
-  EXPECT_EQ(wrong.status, 64);
-  EXPECT_EQ(wrong.errors, "zep: there is no such command; zep --help lists all commands\n");
+  EXPECT_EQ(wrong.fStatus, 64);
+  EXPECT_EQ(wrong.fErrors, "zep: there is no such command; zep --help lists all commands\n");
 }
 
 }  // namespace

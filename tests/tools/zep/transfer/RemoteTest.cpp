@@ -9,7 +9,7 @@ namespace {
 
 TEST(RemoteTest, IsReadAndWritten) {
   struct TRow {
-    char const *text, *url, *shown;
+    char const *fText, *fUrl, *fShown;
   };
   TRow const rows[] = {
       {"ftp://h/f", "ftp://h/f", "ftp://h/f"},
@@ -33,14 +33,14 @@ TEST(RemoteTest, IsReadAndWritten) {
       {"ftp://u:p@h h/f", nullptr, nullptr},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.text);
-    if (row.url == nullptr) {
-      EXPECT_THROW(RemoteOf(row.text, "ftp"), TWrongUsage);
+    SCOPED_TRACE(row.fText);
+    if (row.fUrl == nullptr) {
+      EXPECT_THROW(RemoteOf(row.fText, "ftp"), TWrongUsage);
       continue;
     }
-    TRemote const remote = RemoteOf(row.text, "ftp");
-    EXPECT_EQ(UrlOf(remote), row.url);
-    EXPECT_EQ(ShownUrlOf(remote), row.shown);
+    TRemote const remote = RemoteOf(row.fText, "ftp");
+    EXPECT_EQ(UrlOf(remote), row.fUrl);
+    EXPECT_EQ(ShownUrlOf(remote), row.fShown);
   }
 }
 

@@ -18,8 +18,8 @@ TReport ReportOn(TReportAnswer const& hostName) {
 
 TEST(ReportFileNameTest, BearsTheHostNameOfTheReport) {
   struct TRow {
-    TReportAnswer hostName;
-    std::string inName;
+    TReportAnswer fHostName;
+    std::string fInName;
   };
   TRow const rows[] = {
       {TReportAnswer::Known("db1", ""), "db1"},
@@ -29,9 +29,9 @@ TEST(ReportFileNameTest, BearsTheHostNameOfTheReport) {
       {TReportAnswer(), "unknown"},
   };
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.inName);
-    EXPECT_THAT(ReportFileName(ReportOn(row.hostName), ".txt"),
-                testing::MatchesRegex("zep-report-" + row.inName + "-[0-9]{8}T[0-9]{6}Z\\.txt"));
+    SCOPED_TRACE(row.fInName);
+    EXPECT_THAT(ReportFileName(ReportOn(row.fHostName), ".txt"),
+                testing::MatchesRegex("zep-report-" + row.fInName + "-[0-9]{8}T[0-9]{6}Z\\.txt"));
   }
   EXPECT_THAT(ReportFileName({}, ".json"), testing::MatchesRegex("zep-report-unknown-[0-9]{8}T[0-9]{6}Z\\.json"));
 }

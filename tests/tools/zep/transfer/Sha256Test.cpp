@@ -13,8 +13,8 @@ namespace {
 
 TEST(Sha256Test, KnownTextsHaveTheChecksumsOfTheStandard) {
   struct TRow {
-    std::string text;
-    char const* sum;
+    std::string fText;
+    char const* fSum;
   };
   TRow const rows[] = {
       {"", "e3b0c44298fc1c149afbf4c8996fb92427ae41e4649b934ca495991b7852b855"},
@@ -25,8 +25,8 @@ TEST(Sha256Test, KnownTextsHaveTheChecksumsOfTheStandard) {
   };
   TTempDir const dir;
   for (TRow const& row : rows) {
-    WriteFile(dir.Path("f"), row.text);
-    EXPECT_EQ(Sha256Of(dir.Path("f")), row.sum) << row.text.size();
+    WriteFile(dir.Path("f"), row.fText);
+    EXPECT_EQ(Sha256Of(dir.Path("f")), row.fSum) << row.fText.size();
   }
 }
 

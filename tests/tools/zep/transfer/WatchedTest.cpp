@@ -25,9 +25,9 @@ std::function<TZEPStatusCode()> Thrown(EZEPStatusCode status, char const* reason
 
 TEST(RunWatchedTest, OutcomeIsTheFailureThatTheTransferThrows) {
   struct TRow {
-    std::function<TZEPStatusCode()> transfer;
-    EExitStatus exit;
-    char const* reason;
+    std::function<TZEPStatusCode()> fTransfer;
+    EExitStatus fExit;
+    char const* fReason;
   };
   TRow const rows[] = {
       {[] { return kZEPStatusOK; }, kExitComplete, ""},
@@ -54,10 +54,10 @@ TEST(RunWatchedTest, OutcomeIsTheFailureThatTheTransferThrows) {
   TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, "an error before the transfer");
   Hide("topsecret");
   for (TRow const& row : rows) {
-    SCOPED_TRACE(row.reason);
-    TOutcome const outcome = RunWatched(row.transfer, TWatch());
-    EXPECT_EQ(outcome.fExit, row.exit);
-    EXPECT_EQ(outcome.fReason, row.reason);
+    SCOPED_TRACE(row.fReason);
+    TOutcome const outcome = RunWatched(row.fTransfer, TWatch());
+    EXPECT_EQ(outcome.fExit, row.fExit);
+    EXPECT_EQ(outcome.fReason, row.fReason);
   }
 }
 
