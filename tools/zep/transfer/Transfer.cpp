@@ -11,16 +11,16 @@
 #include "tools/zep/processes/TChildProcess.h"
 #include "tools/zep/secrets/Secrets.h"
 #include "tools/zep/transfer/Download.h"
+#include "tools/zep/transfer/PartFile.h"
 #include "tools/zep/transfer/PartNote.h"
 #include "tools/zep/transfer/Sha256.h"
+#include "tools/zep/transfer/TLockFile.h"
 #include "tools/zep/transfer/Unreachable.h"
 #include "tools/zep/transfer/Upload.h"
 
 #include <fcntl.h>
-#include <linux/fs.h>
 #include <poll.h>
 #include <signal.h>
-#include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -31,8 +31,6 @@
 #include <cerrno>
 #include <charconv>
 #include <chrono>
-#include <cstdio>
-#include <cstdlib>
 #include <filesystem>
 #include <iostream>
 #include <limits>
@@ -264,105 +262,17 @@ void ExplainUpload(TTransferred& transferred, TRemote const& place, TUploadNames
   outcome.fReason += transferred.fFormerUrl;
 }
 
+// The transfer of a file that was sent, with its checksum. `before`: the file before the transfer.
+TTransferred WithChecksum(TTransferred transferred, struct stat const& before) {
+  std::string const file = transferred.fFile;
+  bool const isAsBefore = IsAsBefore(file, before);
+  std::string const whyNoChecksum = isAsBefore ? WhyNoChecksum(file, transferred.fSha256) : "";
+  if (!isAsBefore || !IsAsBefore(file, before)) return Failed(transferred, kExitPartial, "the file changed while it was sent");
+  if (whyNoChecksum.empty()) return transferred;
+  return Failed(transferred, kExitPartial, "it was sent, but its checksum is not known: " + whyNoChecksum);
+}
+
 // ---- Fetching ----
-
-// A file that only one process at a time can have locked, and that is removed at the end. One that a killed process left is used
-// again. A file with content was not made by zep: it stays.
-class TLockFile {
-public:
-  explicit TLockFile(std::string path) : fPath(std::move(path)) {
-    while (Open() && !IsStillThere()) Close();  // the one that had it has just removed it
-  }
-  ~TLockFile() {
-    struct stat held {};
-    bool const isEmpty = fFile && ::fstat(fFile.get(), &held) == 0 && held.st_size == 0;
-    if (isEmpty && IsStillThere()) ::unlink(fPath.c_str());
-  }
-  TLockFile(TLockFile const&) = delete;
-  TLockFile& operator=(TLockFile const&) = delete;
-
-  std::string const& WhyNotHad() const { return fWhyNotHad; }  // empty when it is
-
-private:
-  bool Open() {
-    fFile = TUniqueFd(::open(fPath.c_str(), O_RDWR | O_CREAT | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC, 0666));
-    int const openError = errno;
-    struct stat opened {};
-    bool const isRegular = fFile && ::fstat(fFile.get(), &opened) == 0 && S_ISREG(opened.st_mode);
-    if (isRegular && ::flock(fFile.get(), LOCK_EX | LOCK_NB) == 0) return true;
-    if (fFile && !isRegular)
-      fWhyNotHad = Printable(fPath) + " is not a regular file";
-    else
-      fWhyNotHad = fFile ? WhyNotLocked(errno) : Printable(fPath) + " cannot be opened: " + ReasonOf(openError);
-    Close();
-    return false;
-  }
-  std::string WhyNotLocked(int error) const {
-    if (error == EWOULDBLOCK) return "another transfer into the file is running";
-    bool const isUnsupported = error == EBADF || error == ENOLCK || error == EOPNOTSUPP;
-    return Printable(fPath) + " cannot be locked: " + ReasonOf(error) +
-           (isUnsupported ? "; its file system does not support locks: fetch to another directory" : "");
-  }
-  void Close() { fFile = TUniqueFd(); }
-  bool IsStillThere() const {
-    struct stat held, named;
-    return ::fstat(fFile.get(), &held) == 0 && ::stat(fPath.c_str(), &named) == 0 && IsSameFile(held, named);
-  }
-
-  std::string fPath, fWhyNotHad;
-  TUniqueFd fFile;
-};
-
-// Gives the file its name, in place of another one only when that is wanted.
-bool Rename(std::string const& from, std::string const& to, bool overwrites) {
-  if (overwrites) return std::rename(from.c_str(), to.c_str()) == 0;
-  if (::renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0) return true;
-  if (errno != EINVAL) return false;  // that a file system knows no such renaming
-  return !fs::exists(to) && std::rename(from.c_str(), to.c_str()) == 0;
-}
-
-bool MakeEmptyFile(std::string const& path) {
-  TUniqueFd const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, kModeOfPart));
-  return static_cast<bool>(file);
-}
-
-// The mode of the file that is replaced, or else the one that the umask allows to a new file.
-mode_t ModeFor(std::string const& file) {
-  struct stat replaced {};
-  if (::stat(file.c_str(), &replaced) == 0) return replaced.st_mode & 0777;
-  mode_t const mask = ::umask(0);
-  ::umask(mask);
-  return 0666 & ~mask;
-}
-
-// Where that fails the file keeps its mode: kModeOfPart, or the one that every file of a file system without modes has.
-void SetMode(std::string const& path, mode_t mode) {
-  TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_CLOEXEC));
-  if (file) ::fchmod(file.get(), mode);
-}
-
-// What there is of a file that did not arrive.
-std::string PartText(std::string const& part) {
-  std::error_code absent;
-  std::uintmax_t const size = fs::file_size(part, absent);
-  return absent ? "; nothing arrived" : "; the " + SizeText(size) + " that arrived are in " + Printable(part);
-}
-
-bool IsRegularFile(std::string const& file) {
-  struct stat status {};
-  return ::lstat(file.c_str(), &status) == 0 && S_ISREG(status.st_mode);
-}
-
-// Why no part can be written; empty when one can. A part that an earlier transfer left stays.
-std::string WhyNoPart(std::string const& part) {
-  struct stat status {};
-  bool const isThere = ::lstat(part.c_str(), &status) == 0;
-  if (isThere && !S_ISREG(status.st_mode)) return Printable(part) + " is not a regular file";
-  if (isThere) return TUniqueFd(::open(part.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC)) ? "" : ReasonOf(errno);
-  if (!MakeEmptyFile(part)) return ReasonOf(errno);
-  ::unlink(part.c_str());
-  return "";
-}
 
 TTransferred BrokenOff(TTransferred transferred, bool wasThere, TTransferState const& state, TTransferOptions const& options) {
   std::string const& part = transferred.fFile;
@@ -380,13 +290,6 @@ TTransferred BrokenOff(TTransferred transferred, bool wasThere, TTransferState c
   return transferred;
 }
 
-// Whether the part is still the file that the download wrote, with all that arrived.
-bool IsAsWritten(std::string const& part, TTransferState const& state) {
-  struct stat status {};
-  return ::lstat(part.c_str(), &status) == 0 && S_ISREG(status.st_mode) && status.st_dev == state.fDevice &&
-         status.st_ino == state.fInode && static_cast<std::uint64_t>(status.st_size) == state.fMoved;
-}
-
 // Gives the part, which is complete, the name of the file. An interrupt before that leaves the part.
 TTransferred Completed(TTransferred transferred, std::string const& file, bool overwrites, TTransferState const& state) {
   std::string const& part = transferred.fFile;
@@ -399,12 +302,9 @@ TTransferred Completed(TTransferred transferred, std::string const& file, bool o
     MarkForResuming(part, state);
     return Failed(transferred, StatusOfInterrupt(), "interrupted" + PartText(part));
   }
-  SetMode(part, ModeFor(file));
-  if (!Rename(part, file, overwrites)) {
-    std::string const reason = ReasonOf(errno);
-    SetMode(part, kModeOfPart);
-    return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + reason);
-  }
+  int const error = RenamePart(part, file, overwrites);
+  if (error != 0)
+    return Failed(transferred, kExitNotWritten, "it arrived, but is still " + Printable(part) + ": " + ReasonOf(error));
   RemoveNote(part);
   transferred.fFile = file;
   return transferred;
@@ -481,14 +381,7 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
     CleanUp(place, names, CleanUpSecondsAfterEnd(options), *state);
   ExplainNoConnection(transferred.fOutcome, place, state->fMoved == 0 && state->fLeft == 0);
   ExplainUpload(transferred, place, names, *state);
-  if (exit != kExitComplete) return Decided(transferred);
-  bool const isAsBefore = IsAsBefore(file, before);
-  std::string const whyNoChecksum = isAsBefore ? WhyNoChecksum(file, transferred.fSha256) : "";
-  if (!isAsBefore || !IsAsBefore(file, before))
-    return Decided(Failed(transferred, kExitPartial, "the file changed while it was sent"));
-  if (!whyNoChecksum.empty())
-    return Decided(Failed(transferred, kExitPartial, "it was sent, but its checksum is not known: " + whyNoChecksum));
-  return Decided(transferred);
+  return Decided(exit == kExitComplete ? WithChecksum(transferred, before) : transferred);
 }
 
 TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, TTransferOptions const& options) {
@@ -498,7 +391,7 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
   transferred.fUrl = ShownUrlOf(remote);
   if (!isReady) return transferred;
   TLockFile const lock(part + ".lock");
-  if (!lock.WhyNotHad().empty()) return Failed(transferred, kExitNotWritten, lock.WhyNotHad());
+  if (!lock.WhyNotHeld().empty()) return Failed(transferred, kExitNotWritten, lock.WhyNotHeld());
   std::string const why = WhyNoPart(part);
   if (!why.empty()) return Failed(transferred, kExitNotWritten, why);
   bool const isThere = IsRegularFile(part);
