@@ -35,8 +35,8 @@ void DescribeClasses(TMemoryNamespace& ns) {
 boost::shared_ptr<TMemoryInstance> AddClock(TMemoryNamespace& ns, char const* name, clockid_t id, EClockKind kind) {
   TMemoryValues values{{"Name", name}, {"Kind", kind}};
   timespec time = {};
-  if (::clock_gettime(id, &time) == 0) values.emplace_back("Seconds", time.tv_sec);
-  if (::clock_getres(id, &time) == 0) values.emplace_back("ResolutionNanoseconds", time.tv_nsec);
+  if (::clock_gettime(id, &time) == 0) values.Set("Seconds", time.tv_sec);
+  if (::clock_getres(id, &time) == 0) values.Set("ResolutionNanoseconds", time.tv_nsec);
   return ns.AddInstance("X_Clock", values);
 }
 

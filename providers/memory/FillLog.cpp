@@ -9,7 +9,8 @@ namespace NQRVZEP20 {
 
 void ThrowRefusal(std::string const& className, std::string const& member, TZEPException const& cause) {
   std::string const refused = member.empty() ? className : className + "." + member;
-  std::string const reason = refused + " refused: " + cause.what();
+  auto const* const failure = dynamic_cast<TZEPFailure const*>(&cause);
+  std::string const reason = refused + " refused: " + cause.what() + (failure != nullptr ? ": " + failure->Reason() : "");
   TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, reason);
   throw TZEPFailure(cause.GetStatusCode(), reason);
 }

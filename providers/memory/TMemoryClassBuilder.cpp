@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TMemoryClassBuilder.h"
 
+#include "CIMTypes.h"
 #include "FillLog.h"
 #include "Fitting.h"
 #include "TMemoryClass.h"
+#include "TZEPFailure.h"
 
 namespace NQRVZEP20 {
 
@@ -16,7 +18,8 @@ TCIMValue TextArray(std::vector<std::string> const& texts) {
 // The default value of a property of that type.
 TCIMValue DefaultOf(TMemoryType const& type, TCIMValue const& value) {
   TCIMValue const fitted = FittedTo(type.GetNull(), value);
-  if (fitted.GetType() != type.GetType()) throw TZEPException(kZEPStatusTypeMismatch);
+  if (!HasTypeName(type.GetType())) throw TZEPFailure(kZEPStatusTypeMismatch, "a type of that name does not exist");
+  if (fitted.GetType() != type.GetType()) throw TZEPFailure(kZEPStatusTypeMismatch, WhyNotOf(type.GetType(), fitted));
   return fitted;
 }
 

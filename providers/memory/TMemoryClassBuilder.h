@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "LongLong.h"
 #include "TCIMValue.h"
 #include "TMemoryType.h"
 
@@ -32,6 +33,10 @@ public:
   // ---- Properties. A default value follows the rules of TMemoryInstance::Set. ----
 
   TMemoryClassBuilder& Property(std::string const& name, TMemoryType const& type, TCIMValue const& defaultValue = TCIMValue());
+  template <class T, IfLongLong<T> = 0>
+  TMemoryClassBuilder& Property(std::string const& name, TMemoryType const& type, T defaultValue) {
+    return Property(name, type, FromLongLong(defaultValue));
+  }
   TMemoryClassBuilder& Key(std::string const& name, TMemoryType const& type);
 
   // A property that refers to instances of that class, which must exist.
@@ -40,6 +45,10 @@ public:
 
   // A property whose value belongs to the class.
   TMemoryClassBuilder& Static(std::string const& name, TMemoryType const& type, TCIMValue const& value);
+  template <class T, IfLongLong<T> = 0>
+  TMemoryClassBuilder& Static(std::string const& name, TMemoryType const& type, T value) {
+    return Static(name, type, FromLongLong(value));
+  }
 
   // ---- Methods, and the parameters of the method described last. An in-out parameter is an In with the qualifier Out. ----
 
@@ -59,6 +68,10 @@ public:
 
   // Any qualifier that the namespace declares, with its declared flavor. An integer may be given in any integer type.
   TMemoryClassBuilder& Qualifier(std::string const& name, TCIMValue const& value);
+  template <class T, IfLongLong<T> = 0>
+  TMemoryClassBuilder& Qualifier(std::string const& name, T value) {
+    return Qualifier(name, FromLongLong(value));
+  }
 
   boost::shared_ptr<TMemoryClass> Class() const { return fClass; }
 

@@ -2,23 +2,21 @@
 #pragma once
 
 #include "ICIMInstance.h"
+#include "LongLong.h"
 #include "TCIMValue.h"
 #include "TMemoryProperty.h"
+#include "TMemoryValues.h"
 #include "TNamedList.h"
 
 #include <boost/enable_shared_from_this.hpp>
 
 #include <string>
-#include <utility>
 #include <vector>
 
 namespace NQRVZEP20 {
 
 class TMemoryClass;
 class TMemoryPropertyDecl;
-
-// The property values of a new instance by name: {{"Id", 5u}, {"Name", "sda"}}.
-using TMemoryValues = std::vector<std::pair<std::string, TCIMValue>>;
 
 // The layout that all instances of a class share: the declarations of all properties, including inherited ones, in the order of
 // ICIMInstance::EnumerateProperties; and the positions of the keys.
@@ -44,6 +42,10 @@ public:
   // makes a property of any type NULL. Throws kZEPStatusNotFound for a property that the class does not have, and everything that
   // ICIMProperty::SetValue throws.
   void Set(std::string const& name, TCIMValue const& value);
+  template <class T, IfLongLong<T> = 0>
+  void Set(std::string const& name, T number) {
+    Set(name, FromLongLong(number));
+  }
 
   // The value of a property; throws kZEPStatusNotFound for a property that the class does not have.
   TCIMValue Get(std::string const& name) const;

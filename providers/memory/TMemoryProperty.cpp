@@ -2,8 +2,9 @@
 #include "TMemoryProperty.h"
 
 #include "CIMTypes.h"
+#include "Fitting.h"
 #include "TMemoryPropertyDecl.h"
-#include "TZEPException.h"
+#include "TZEPFailure.h"
 
 #include <utility>
 
@@ -16,7 +17,7 @@ TCIMValue TMemoryProperty::GetValue(TCIMContext const&) const { return fValue; }
 
 void TMemoryProperty::SetValue(TCIMValue const& value, TCIMContext const&) {
   if (fIsFixed) throw TZEPException(kZEPStatusInvalidOpSequence);
-  if (value.GetType() != fValue.GetType()) throw TZEPException(kZEPStatusTypeMismatch);
+  if (value.GetType() != fValue.GetType()) throw TZEPFailure(kZEPStatusTypeMismatch, WhyNotOf(fValue.GetType(), value));
 
   // An assignment of an equal value changes nothing, and any two char16 are equal. Therefore the old value is dropped first.
   TCIMValue copy(value);

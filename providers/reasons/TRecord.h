@@ -5,6 +5,7 @@
 #include "TFinding.h"
 
 #include <string>
+#include <type_traits>
 #include <utility>
 #include <vector>
 
@@ -58,15 +59,26 @@ public:
   template <class T>
   void Add(std::string name, TFinding<T> const& finding) {
     if (finding)
-      fProperties.push_back({std::move(name), TCIMValue(*finding), false, fSource, {}});
+      fProperties.push_back({std::move(name), ValueOf(*finding), false, fSource, {}});
     else
-      fProperties.push_back({std::move(name), TCIMValue(TCIMValue(T()).GetType(), 0), false, fSource, finding.Why()});
+      fProperties.push_back({std::move(name), TCIMValue(ValueOf(T()).GetType(), 0), false, fSource, finding.Why()});
   }
 
   std::string const& GetClassName() const { return fClassName; }
   std::vector<TRecordProperty> const& GetProperties() const { return fProperties; }
 
 private:
+  // The constructors of TCIMValue are ambiguous for long long and unsigned long long.
+  template <class T>
+  static TCIMValue ValueOf(T const& value) {
+    if constexpr (std::is_same_v<T, long long>)
+      return TCIMValue(static_cast<long>(value));
+    else if constexpr (std::is_same_v<T, unsigned long long>)
+      return TCIMValue(static_cast<unsigned long>(value));
+    else
+      return TCIMValue(value);
+  }
+
   std::string fClassName;
   std::string fSource;
   std::vector<TRecordProperty> fProperties;

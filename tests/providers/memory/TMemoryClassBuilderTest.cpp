@@ -117,12 +117,15 @@ TEST_F(TMemoryClassBuilderTest, RefusalIsLoggedAndEarlierElementsRemain) {
     EZEPStatusCode fStatus;
     char const* fMessage;
   } const rows[] = {
-      {[](auto& cls) { cls.Property("Name", "text"); }, kZEPStatusTypeMismatch, "X_Disk.Name refused: kZEPStatusTypeMismatch"},
+      {[](auto& cls) { cls.Property("Name", "text"); }, kZEPStatusTypeMismatch,
+       "X_Disk.Name refused: kZEPStatusTypeMismatch: a type of that name does not exist"},
       {[](auto& cls) { cls.Property("Id", "uint8"); }, kZEPStatusAlreadyExists, "X_Disk.Id refused: kZEPStatusAlreadyExists"},
-      {[](auto& cls) { cls.Property("N", "uint8", 256); }, kZEPStatusTypeMismatch, "X_Disk.N refused: kZEPStatusTypeMismatch"},
+      {[](auto& cls) { cls.Property("N", "uint8", 256); }, kZEPStatusTypeMismatch,
+       "X_Disk.N refused: kZEPStatusTypeMismatch: 256 is outside the range of uint8, 0 to 255"},
       {[](auto& cls) { cls.Key("a-b", "uint8"); }, kZEPStatusInvalidCIMName, "X_Disk.a-b refused: kZEPStatusInvalidCIMName"},
       {[](auto& cls) { cls.Reference("R", "X_Dsk"); }, kZEPStatusNotFound, "X_Disk.R refused: kZEPStatusNotFound"},
-      {[](auto& cls) { cls.Static("S", "uint8", "a"); }, kZEPStatusTypeMismatch, "X_Disk.S refused: kZEPStatusTypeMismatch"},
+      {[](auto& cls) { cls.Static("S", "uint8", "a"); }, kZEPStatusTypeMismatch,
+       "X_Disk.S refused: kZEPStatusTypeMismatch: the value is a string instead of a uint8"},
       {[](auto& cls) { cls.Method("M", "uint8[]"); }, kZEPStatusTypeMismatch, "X_Disk.M refused: kZEPStatusTypeMismatch"},
       {[](auto& cls) { cls.In("P", "uint8"); }, kZEPStatusInvalidOpSequence, "X_Disk.P refused: kZEPStatusInvalidOpSequence"},
       {[](auto& cls) { cls.Qualifier("Huh", true); }, kZEPStatusNotFound, "X_Disk.[Huh] refused: kZEPStatusNotFound"},

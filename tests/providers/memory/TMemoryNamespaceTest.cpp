@@ -363,7 +363,7 @@ TEST(TMemoryNamespaceTest, RefusalIsLoggedAndTravelsWithTheFailure) {
       {[&] {
          ns->AddInstance("X_Disk", {{"Id", "a"}});
        },
-       kZEPStatusTypeMismatch, "X_Disk.Id refused: kZEPStatusTypeMismatch"},
+       kZEPStatusTypeMismatch, "X_Disk.Id refused: kZEPStatusTypeMismatch: the value is a string instead of a uint32"},
       {[&] {
          ns->AddInstance("X_Disk", {{"id", 5}});
        },

@@ -42,6 +42,15 @@ TEST(TRecordTest, AMissingValueIsNullOfThePropertysType) {
                                                 "IsReady boolean NULL unreadable: the file cannot be read (sysfs)"));
 }
 
+TEST(TRecordTest, ANumberMayBeALongLong) {
+  TRecord record("X_Disk", "sysfs");
+  record.AddKey("Id", TFinding<unsigned long long>(7ULL));
+  record.Add("Offset", TFinding<long long>(-5LL));
+  record.Add("Size", TFinding<unsigned long long>(kUnreadable));
+  EXPECT_THAT(PropertiesOf(record), ElementsAre("key Id uint64 7 (sysfs)", "Offset sint64 -5 (sysfs)",
+                                                "Size uint64 NULL unreadable: the file cannot be read (sysfs)"));
+}
+
 TEST(TRecordTest, AKeyThatTheProviderChoosesHasNoSource) {
   TRecord record("X_Disk", "sysfs");
   record.AddKey("Name", "sda");

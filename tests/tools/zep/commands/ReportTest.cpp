@@ -565,10 +565,13 @@ TEST_F(ReportTest, TheReasonOfAFailureIsReported) {
   TRun const run = RunWithTestProvider("is-refused", {"--json"});
   EXPECT_EQ(run.fStatus, 2);
   std::string const error = JsonOf(run)["plugIns"][1]["providers"][0]["error"];
-  EXPECT_EQ(error, "kZEPStatusTypeMismatch (X_Refused.Kind refused: kZEPStatusTypeMismatch)");
+  EXPECT_EQ(error,
+            "kZEPStatusTypeMismatch (X_Refused.Kind refused: kZEPStatusTypeMismatch: the value is a string instead of a uint16)");
   EXPECT_EQ(WithoutBlanks(PlugInRowsOf(RunWithTestProvider("is-refused").fOutput)[1][2]),
-            WithoutBlanks("provider Test failed: " + error +
-                          " (fill, libTest.nsp.so); last log line: [Error] X_Refused.Kind refused: kZEPStatusTypeMismatch"));
+            WithoutBlanks(
+                "provider Test failed: " + error +
+                " (fill, libTest.nsp.so); last log line: [Error] X_Refused.Kind refused: kZEPStatusTypeMismatch: the value is a "
+                "string instead of a uint16"));
 }
 
 TEST_F(ReportTest, ANamespaceThatFailsLaterIsReportedWhereItFails) {
