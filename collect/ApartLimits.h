@@ -5,11 +5,11 @@
 
 namespace NQRVZEP20 {
 
-// The limits for the process of a plug-in. A process that exceeds one is ended, with every process that it started.
+// The limits for a plug-in process. If it exceeds one, it is killed with all processes that it started.
 struct TApartLimits {
-  int fTimeoutSeconds = 60;                           // for the load of the library, and again for the fill of all its namespaces
-  std::uint64_t fMemoryMebibytes = 0;                 // that the process may use in addition to those of this process; 0: any
-  std::uint64_t fAnswerBytes = 256ull * 1024 * 1024;  // of one namespace
+  int fTimeoutSeconds = 60;                           // for loading the library, and again for filling all its namespaces
+  std::uint64_t fMemoryMebibytes = 0;                 // memory in addition to what this process uses; 0: no limit
+  std::uint64_t fAnswerBytes = 256ull * 1024 * 1024;  // the size of one serialised namespace
 };
 
 }  // namespace NQRVZEP20

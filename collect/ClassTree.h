@@ -8,7 +8,7 @@
 
 namespace NQRVZEP20 {
 
-// A class and its place in the tree. It shares the class with the namespace.
+// A class and its position in the class tree. Shares ownership of the class with the namespace.
 struct TClassEntry {
   boost::shared_ptr<ICIMClass> fClass;
   std::string fName;
@@ -19,11 +19,11 @@ struct TClassEntry {
   std::size_t fDepth;  // the number of classes above it
 };
 
-// Whether the class itself has the qualifier, with a value other than false. Passes on what the class throws.
+// Whether the class itself has the qualifier, with a value other than false. Exceptions thrown by the class pass through.
 bool HasSetQualifier(ICIMClass const& cls, std::string const& qualifierName);
 
-// Every class of the namespace, each after its superclass. Passes on what the namespace throws, which may be of any type
-// (FailureOf.h).
+// All classes of the namespace, each after its superclass. Exceptions thrown by the namespace, which may be of any type
+// (FailureOf.h), pass through.
 std::vector<TClassEntry> ClassesOf(ICIMNamespace const& ns);
 
 }  // namespace NQRVZEP20

@@ -3,7 +3,7 @@
 
 namespace NQRVZEP20 {
 
-// How much of a report could be had.
+// The completeness of a report.
 enum class ECompleteness {
   kComplete,  // every row of the identity is known, or does not apply to this machine, and no plug-in failed
   kPartial,   // a row of the identity is missing, or a plug-in failed

@@ -6,8 +6,8 @@
 
 namespace NQRVZEP20 {
 
-// Calls `work`, which runs code of a plug-in, and returns why it failed; empty when it succeeded. A plug-in may throw anything,
-// so nothing that `work` throws leaves this function.
+// Calls `work`, which runs code of a plug-in, and returns the reason why it failed, or an empty string if it succeeded. Catches
+// every exception, because a plug-in may throw any type.
 template <class TWork>
 std::string FailureOf(TWork work) {
   try {

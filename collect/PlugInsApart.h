@@ -12,30 +12,31 @@
 
 namespace NQRVZEP20 {
 
-// A plug-in at work.
+// A plug-in that is being loaded or is filling its namespaces.
 struct TPlugInAtWork {
-  std::string fName;   // of the plug-in
+  std::string fName;   // the name of the plug-in
   std::string fStage;  // such as "fill"
-  double fSeconds;     // since the stage began
+  double fSeconds;     // the time since the stage began
 };
 
 struct TApartOptions {
   TApartLimits fLimits;
-  std::size_t fParallel = 0;  // how many processes work at once; 0: as many as this process may use processors
+  std::size_t fParallel = 0;  // the maximum number of concurrent processes; 0: the number of processors that this process may use
 
-  // Called several times a second with the plug-ins at work, and at the end with none. May be empty.
+  // Called several times a second with the plug-ins that are running, and at the end with none. May be empty.
   std::function<void(std::vector<TPlugInAtWork> const&)> fShowProgress;
 };
 
-// The same as LoadPlugIns, with each plug-in in a process of its own, several at once: whatever a plug-in does costs only its own
-// result. The namespaces come from the processes as bytes and do not change. The results are in the order of the names; of two
-// providers with the same name the first one counts, and the other one fails.
+// Like LoadPlugIns, but runs each plug-in in a process of its own, several in parallel, so that a faulty plug-in affects only
+// its own result. The namespaces are immutable copies, which the processes send in serialised form. The results are in the
+// order of the plug-in names; if two providers have the same name, the first one is used and the other one fails.
 //
-// What a plug-in prints is in its result, and what it logs is logged here after it has ended. When this function returns, or this
-// process dies, no process is left that a plug-in started.
+// The printed output of a plug-in is in its result; its log entries are written to this process's log after it has ended. No
+// process that a plug-in started outlives this call or this process.
 //
-// It forks this process. Call it before other threads are started. A plug-in sees the memory of this process as it was then; a
-// front end that holds passwords reads them afterwards. Throws TZEPException only when the directory of plug-ins cannot be read.
+// Forks this process: call it before other threads are started. A plug-in can read the memory that this process had at that
+// time, so read passwords afterwards. Throws TZEPException only if the plug-in directory cannot be read. Blocks until all
+// plug-ins have ended or exceeded a limit.
 std::vector<TPlugIn> LoadPlugInsApart(std::optional<TSample> const& sample = std::nullopt, TApartOptions const& options = {});
 
 }  // namespace NQRVZEP20

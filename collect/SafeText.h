@@ -8,8 +8,8 @@
 
 namespace NQRVZEP20 {
 
-// Text from firmware or a plug-in may contain anything: control characters, characters that change the direction of writing, and
-// bytes that are not UTF-8. These functions read within the bounds of the text and throw nothing but std::bad_alloc.
+// Text from firmware or a plug-in may contain anything: control characters, characters that change the writing direction, and
+// bytes that are not valid UTF-8. These functions never read out of bounds and throw only std::bad_alloc.
 
 struct TCharacter {
   std::uint32_t fCode;  // the code point, or the byte
@@ -19,12 +19,12 @@ struct TCharacter {
 // The character with which `text`, which is not empty, begins.
 TCharacter FirstCharacterOf(std::string_view text);
 
-// The text made safe for a terminal: characters that control it or hide text, and bytes that are not UTF-8, become escapes such
-// as "\x1b" or "\u202e".
+// The text in a form that is safe to print on a terminal: characters that control the terminal or hide text, and bytes that are
+// not valid UTF-8, become escapes such as "\x1b" or "\u202e".
 std::string Printable(std::string_view text);
 
-// The same text as UTF-8 without zero bytes: each zero byte and each byte that is not UTF-8 becomes an escape such as "\x00" or
-// "\xff". Other characters remain, including control characters.
+// The text as valid UTF-8 without zero bytes: each zero byte and each byte that is not valid UTF-8 becomes an escape such as
+// "\x00" or "\xff". Other characters remain, including control characters.
 std::string WithBytesEscaped(std::string_view text);
 
 }  // namespace NQRVZEP20

@@ -5,27 +5,28 @@
 
 namespace NQRVZEP20 {
 
-// A sample: the SMBIOS table of another machine, read instead of this machine's tables, and the label that keeps the two apart.
+// A sample: the SMBIOS table of another machine, read instead of this machine's tables, and a label that distinguishes its
+// values from those of this machine.
 //
-// Pass it to LoadPlugIns and MakeReport. Every source of a value is then labelled: the sample's values bear the label, and
-// values that providers still read from this machine, such as its operating system, are marked "(not of the sample)".
+// Pass it to LoadPlugIns or LoadPlugInsApart, and to MakeReport. Every source of a value is then labelled: sources in the
+// sample have the label, and those on this machine, such as its operating system, are marked "(not of the sample)".
 struct TSample {
   std::string fTableFile;  // the path of the table, in the form that ZEP_SMBIOS_TABLE accepts
   std::string fHostName;   // the host name to report; empty for this machine's own
   std::string fLabel;      // such as "SAMPLE"; not empty
 };
 
-// Makes providers read the sample, by setting the environment variables ZEP_SMBIOS_TABLE and ZEP_HOST_NAME of this process.
-// The variables stay set, because a provider may read them at any later time. LoadPlugIns calls this. Like every change of the
-// environment, it must not run beside other threads that read or change the environment.
+// Makes providers read the sample, by setting the environment variables ZEP_SMBIOS_TABLE and ZEP_HOST_NAME of this process. The
+// variables stay set, because a provider may read them at any later time. LoadPlugIns calls this function. Not thread-safe: no
+// other thread may read or change the environment during the call.
 void SetForProviders(TSample const& sample);
 
-// The table file that the user named in ZEP_SMBIOS_TABLE, to be read instead of this machine's tables; empty when there is none.
-// After SetForProviders this is the sample's file.
+// The value of ZEP_SMBIOS_TABLE: the table file to read instead of this machine's tables; empty if it is not set. After
+// SetForProviders this is the sample's file.
 std::string NamedTableFile();
 
-// The source of a value as it is to be printed. `label` is that of the sample, or empty without a sample: then the source is
-// returned unchanged.
+// The source of a value in the form to print. `label` is the label of the sample; if it is empty, because there is no sample,
+// the source is returned unchanged.
 std::string LabelledSource(std::string const& source, std::string const& label);
 
 }  // namespace NQRVZEP20

@@ -14,18 +14,18 @@ namespace NQRVZEP20 {
 
 class ICIMPropertyDecl;
 
-// A provider's namespace as a front end reads it: instances by class, paths that are unique, and for each value its source and,
-// when it is missing, the reason.
+// A front end's view of a provider's namespace: instances by class, unique paths, and for each value its source and, if it is
+// missing, the reason.
 //
-// Sources and reasons are those that the provider states in its namespace (TReasonReader.h); otherwise the provider's name is the
-// source, and the reason is a general one.
+// Sources and reasons are those that the provider recorded in its namespace (TReasonReader.h); otherwise the source is the
+// provider's name, and the reason is a generic one.
 //
-// A copy shares the namespace, which lives as long as one of them. Use a view from one thread at a time; PathOf caches. All
-// members pass on the exceptions of the provider, which may be of any type (FailureOf.h), and block for as long as the provider
+// Copies share ownership of the namespace. Use a view from one thread at a time, because PathOf caches. In all members,
+// exceptions of the provider, which may be of any type (FailureOf.h), pass through; each call blocks as long as the provider
 // does.
 class TNamespaceView {
 public:
-  // Reads the reasons. `ns` is not null. `sampleLabel`: the label of the sample from which the provider reads, if any.
+  // Reads the reasons. `ns` must not be null. `sampleLabel`: the label of the sample that the provider reads, if any.
   TNamespaceView(std::string providerName, boost::shared_ptr<ICIMNamespace> ns, std::string sampleLabel = "");
 
   std::string GetName() const;
@@ -33,32 +33,32 @@ public:
   std::string const& GetSampleLabel() const { return fSampleLabel; }
   boost::shared_ptr<ICIMNamespace> Get() const { return fNamespace; }
 
-  // Empty when there is no such class.
+  // The returned pointer is empty if there is no such class.
   boost::shared_ptr<ICIMClass> FindClass(std::string const& name) const;
 
-  // The instances of the class and of the classes below it; none when there is no such class.
+  // The instances of the class and its subclasses; none if there is no such class.
   std::vector<boost::shared_ptr<ICIMInstance>> InstancesOf(std::string const& className) const;
   std::vector<boost::shared_ptr<ICIMInstance>> AllInstances() const;
 
-  // The object path with the namespace before it: "root/zep/host:CIM_Chassis.Tag=...". No two instances have the same, and it is
-  // UTF-8 without zero bytes: other bytes become escapes such as "\xff", which cannot be confused with a value, because a path
-  // doubles the backslashes of values. An instance without any key value has its number among those of its class, from 1, in
-  // place of the keys: "root/x:X_Disk#2".
+  // The object path with the namespace as a prefix: "root/zep/host:CIM_Chassis.Tag=...". It is unique, and valid UTF-8 without
+  // zero bytes: other bytes become escapes such as "\xff", which are unambiguous because backslashes in values are doubled. For
+  // an instance without any key value, the path contains its number among such instances of its class, starting at 1, instead
+  // of keys: "root/x:X_Disk#2".
   std::string PathOf(ICIMInstance const& instance) const;
 
-  // Labelled when there is a sample (Sample.h).
+  // The source, labelled if there is a sample (Sample.h).
   std::string SourceOf(ICIMPropertyDecl const& property) const;
 
   TMissing WhyMissing(ICIMInstance const& instance, std::string const& property) const;
   TMissing WhyNoInstance(std::string const& className) const;
 
-  // The value of a property, with its CIM type: numbers stay numbers.
+  // The value of a property as a typed CIM value.
   TAnswer<TCIMValue> Answer(ICIMInstance const& instance, std::string const& name) const;
 
-  // The same for a property of the first instance of the class. When there is none, the reason is the class's.
+  // The same for a property of the first instance of the class. If there is no instance, the answer is AnswerWithoutInstance.
   TAnswer<TCIMValue> AnswerOfFirst(std::string const& className, std::string const& property) const;
 
-  // The same where the class has no instance or does not exist: always unknown.
+  // The answer for a class that has no instance or does not exist: always unknown, with the reason for the class.
   TAnswer<TCIMValue> AnswerWithoutInstance(std::string const& className, std::string const& property) const;
 
 private:
@@ -69,7 +69,7 @@ private:
   std::string fSampleLabel;  // empty without a sample
   TReasonReader fReasons;
 
-  // Instances without key values, by class; only of classes that NumberOf was called for.
+  // Instances without key values, by class; only for classes for which NumberOf has been called.
   mutable std::map<std::string, std::vector<boost::shared_ptr<ICIMInstance>>> fWithoutKeys;
 };
 

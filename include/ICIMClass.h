@@ -12,27 +12,27 @@ class ICIMProperty;
 class ICIMPropertyDecl;
 
 // A CIM class: its name, superclass, qualifiers, property and method declarations, and its instances. Some operations have a
-// default body, so that a plug-in may leave them out. Unless the comment says otherwise, the default body logs an error and
-// throws kZEPStatusNotImplemented. ICIMElement.h lists the operations that each use needs.
+// default body, so that a plug-in may omit them. Unless a comment states otherwise, the default body logs an error and throws
+// kZEPStatusNotImplemented. ICIMElement.h lists the operations that each use needs.
 class ZEP_EXPORT ICIMClass : public ICIMNamedElement {
 public:
   ~ICIMClass() override;
 
   virtual boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) const = 0;
 
-  // True for an association: the class or one of its superclasses carries the qualifier Association. A namespace copy creates
+  // True for an association: the class or one of its superclasses has the qualifier Association. A namespace copy creates
   // associations in a second pass, after every class that they refer to.
   virtual bool GetClassFlag(TCIMContext const& context) const = 0;
 
-  // True when this class itself carries the qualifier Abstract: it cannot have instances of its own. Has a default body,
-  // which returns false.
+  // True when this class itself has the qualifier Abstract: it cannot have instances of its own. Has a default body, which
+  // returns false.
   virtual bool IsAbstract(TCIMContext const& context) const;
 
   virtual bool IsRootClass(TCIMContext const& context) const = 0;                            // it has no superclass
   virtual boost::shared_ptr<ICIMClass> GetSuperClass(TCIMContext const& context) const = 0;  // empty for a root class
 
-  // Visits every class derived from this one, at any depth, but not the class itself. A class comes after its superclass;
-  // siblings come in the order in which they were created.
+  // Visits all direct and indirect subclasses, but not the class itself. A class is visited after its superclass; siblings
+  // are visited in the order in which they were created.
   virtual void EnumerateSubClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)> callback,
                                    TCIMContext const& context) const = 0;
 
@@ -40,7 +40,7 @@ public:
 
   // Between these two calls the caller declares the elements of the class. GetPropertyDecl then returns an empty pointer for
   // a name that is not declared yet, instead of throwing. The calls do not nest; EndDeclarations without BeginDeclarations
-  // does nothing. Both have a default body, which does nothing.
+  // has no effect. Both have a default body, which does nothing.
   virtual void BeginDeclarations(TCIMContext const& context);
   virtual void EndDeclarations(TCIMContext const& context);
 
@@ -73,7 +73,7 @@ public:
 
   // ---- Instances ----
 
-  // Creates an instance whose properties have their defaults. Until CommitInstance, only the caller holds it, and
+  // Creates an instance whose properties have their default values. Until CommitInstance, only the caller holds it, and
   // enumerations do not visit it. Throws kZEPStatusInvalidClass for an abstract class.
   virtual boost::shared_ptr<ICIMInstance> CreateInstance(TCIMContext const& context) = 0;
 

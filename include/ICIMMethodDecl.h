@@ -7,7 +7,8 @@ namespace NQRVZEP20 {
 
 class ICIMParameterDecl;
 
-// The declaration of a method in a class: a name, a return type and parameters. There is no operation that calls a method.
+// The declaration of a method in a class: a name, a return type and parameters. Methods cannot be called through this
+// interface.
 class ZEP_EXPORT ICIMMethodDecl : public ICIMNamedElement {
 public:
   ~ICIMMethodDecl() override;

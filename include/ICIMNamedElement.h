@@ -8,20 +8,20 @@ namespace NQRVZEP20 {
 
 class ICIMQualifier;
 
-// A schema element that has a name and may carry qualifiers: a class, property, method or parameter declaration. A qualifier
-// with the boolean value false counts as missing where a rule of these interfaces depends on it, such as Key, Abstract or
-// Association.
+// A schema element that has a name and may have qualifiers: a class, property, method or parameter declaration. A qualifier
+// with the boolean value false is treated as missing where a rule of these interfaces depends on it, such as Key, Abstract
+// or Association.
 class ZEP_EXPORT ICIMNamedElement : public ICIMElement {
 public:
   ~ICIMNamedElement() override;
 
   virtual std::string GetName(TCIMContext const& context) const = 0;
 
-  // Returns the qualifier written on this element itself, or an empty pointer when there is none, even if the element of a
+  // Returns the qualifier of this element itself, or an empty pointer if it has none, even if the corresponding element of a
   // superclass has one.
   virtual boost::shared_ptr<ICIMQualifier> GetQualifier(std::string const& name, TCIMContext const& context) const = 0;
 
-  // Visits the qualifiers written on this element itself, in the order in which they were added.
+  // Visits the qualifiers of this element itself, in the order in which they were added.
   virtual void EnumerateQualifiers(boost::function<bool(boost::shared_ptr<ICIMQualifier>)> callback,
                                    TCIMContext const& context) const = 0;
 

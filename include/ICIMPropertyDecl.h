@@ -14,7 +14,7 @@ public:
   virtual TCIMValue::TCIMType GetType(TCIMContext const& context) const = 0;
   virtual TCIMValue GetDefaultValue(TCIMContext const& context) const = 0;
 
-  // True when the property is a key: it carries the qualifier Key, or overrides a property that is a key. Has a default body,
+  // True when the property is a key: it has the qualifier Key, or overrides a property that is a key. Has a default body,
   // which logs an error and throws kZEPStatusNotImplemented.
   virtual bool IsKey(TCIMContext const& context) const;
 

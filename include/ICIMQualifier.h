@@ -8,7 +8,7 @@ namespace NQRVZEP20 {
 class ICIMNamedElement;
 class ICIMQualifierDecl;
 
-// A qualifier written on one element: a name, a value and a flavor.
+// A qualifier of one element: a name, a value and a flavor.
 class ZEP_EXPORT ICIMQualifier {
 public:
   virtual ~ICIMQualifier();
@@ -18,7 +18,7 @@ public:
   virtual unsigned int GetFlavor(TCIMContext const& context) const = 0;  // a set of ICIMQualifierDecl::EFlavor
   virtual boost::shared_ptr<ICIMQualifierDecl> GetDeclaration(TCIMContext const& context) const;  // has a default body
 
-  // The element that carries the qualifier. Has a default body, which returns an empty pointer.
+  // The element that has the qualifier. Has a default body, which returns an empty pointer.
   virtual boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const;
 };
 

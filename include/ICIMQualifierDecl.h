@@ -9,7 +9,7 @@ namespace NQRVZEP20 {
 // name.
 class ZEP_EXPORT ICIMQualifierDecl {
 public:
-  // The kinds of element that may carry the qualifier. Values are combined with |.
+  // The kinds of element that may have the qualifier. Values are combined with |.
   enum EScope : unsigned int {
     kScopeClass = 0x01,
     kScopeAssociation = 0x02,

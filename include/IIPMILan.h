@@ -21,8 +21,8 @@ ZEP_EXPORT extern std::string gIPMILanPass;
 
 constexpr int MAXMULTINODE = 16;  // nodes of a server
 
-// The link to the server's management controller. It speaks IPMI over the LAN through the platform library libipmiClient.so,
-// and brings up the controller's USB-LAN interface through the platform library ./ovdusblan.so.
+// The link to the server's management controller. It uses IPMI over LAN through the platform library libipmiClient.so, and
+// brings up the controller's USB-LAN interface through the platform library ./ovdusblan.so.
 //
 // A server has up to 16 nodes (0 to 15), each with a controller and an account of its own. The process has one link, which
 // TRootObject::GetipmiLanIns returns, and one session at a time. No lock is taken: use the link from one thread at a time.
@@ -32,7 +32,7 @@ class ZEP_EXPORT IIPMILan {
 public:
   static constexpr int MAXMULTINODE = NQRVZEP20::MAXMULTINODE;
 
-  // Creates a new link, makes it the link of the process and returns it. An earlier link is not freed: pointers to it stay
+  // Creates a new link, makes it the link of the process and returns it. The previous link is not freed: pointers to it stay
   // valid. Kept.
   static IIPMILan* Initialize();
 
@@ -56,9 +56,9 @@ public:
   // ---- Session ----
 
   // Brings up the USB-LAN of every node whose USB-LAN is down, through the three functions of ./ovdusblan.so. The library is
-  // searched in the working directory and loaded for the duration of the call. Returns false when the library or one of its
-  // functions is missing or the library throws, otherwise true: the result for a single node is ignored. While
-  // m_useGlobalAccount is true, does nothing and returns false.
+  // loaded from the working directory for the duration of the call. Returns false when the library or one of its functions is
+  // missing or the library throws, otherwise true: the result for a single node is ignored. While m_useGlobalAccount is true,
+  // does nothing and returns false.
   bool bringupOvdLan();
 
   // Opens a session on port 623. The arguments are stored (gIPMILanHost and the others) even when opening fails. Returns
@@ -66,8 +66,8 @@ public:
   bool IpmilanOpenConnect(std::string host, std::string user, std::string password);
 
   // Makes `node` (0 to 15) the current node, brings up the USB-LAN of all nodes, and opens a session with the node's
-  // controller at its USB-LAN address, with the node's account. A node outside that range also becomes the current one; its
-  // address and account are empty. `pluginName` is used in log lines only. If `node` is already the current node and
+  // controller at its USB-LAN address, with the node's account. A node outside that range becomes the current one, too; its
+  // address and account are empty. `pluginName` is only used in log lines. If `node` is already the current node and
   // getipmiLanStatus is true, the session is reused and the result is true. While m_enabled is 0 or m_useGlobalAccount is
   // true, does nothing and returns false. If a platform library throws an int, the int is logged and the result is false;
   // other exceptions pass through.
@@ -104,7 +104,7 @@ public:
   // the length byte in a packet with an authentication code, also for a packet without one. `mode` 0 tests the checksum and
   // the completion code, 1 the checksum, 2 the completion code, any other value nothing. Success makes getipmiLanStatus true;
   // failure does not change it. A test that would need a byte before the start of the packet fails. After the length byte,
-  // the buffer must contain as many bytes as the message length, and at least 7.
+  // the buffer must contain at least as many bytes as the message length, and never less than 7.
   bool ChkResponse(char* packet, int lengthPosition, int mode);
 
   static IIPMILan* fgipmilanInstance;             // null before Initialize

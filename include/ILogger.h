@@ -19,7 +19,7 @@ public:
     kLogStatus = 2,
     kLogDebug = 3,
     kLogVerbose = 4,
-    kLogMemoryOnly = 100,       // recorded in the in-memory list whatever the threshold is; never written to a file
+    kLogMemoryOnly = 100,       // recorded in the in-memory list regardless of the threshold; never written to a file
     kLogMemoryOnlyAlways = 101  // the same, recorded with this severity
   };
 

@@ -14,8 +14,9 @@ public:
   // The name under which the provider is registered. Called once, at registration, with an empty context.
   virtual std::string const& GetName(TCIMContext const& context) const = 0;
 
-  // The namespace of the provider, which owns it; the same one on each call. The first call may block while the provider
-  // collects its data. Empty when the provider has no namespace. Has a default body, which returns an empty pointer.
+  // The namespace of the provider, which the provider owns; the same one on each call. The first call may block while the
+  // provider collects its data. The pointer is empty if the provider has no namespace. Has a default body, which returns an
+  // empty pointer.
   virtual boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& /*context*/) { return {}; }
 };
 

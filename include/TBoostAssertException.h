@@ -9,8 +9,8 @@
 
 namespace NQRVZEP20 {
 
-// Reports a failed assertion and carries the complete message. Thrown only while the environment variable ZEP_BOOST_ASSERT is
-// "throwboost"; AssertionHandler.h lists the other settings.
+// The exception for a failed assertion, with the complete message. Thrown only while the environment variable
+// ZEP_BOOST_ASSERT is "throwboost"; AssertionHandler.h lists the other settings.
 class ZEP_EXPORT TBoostAssertException : public std::exception {
 public:
   TBoostAssertException(std::string message) : fMessage(std::move(message)) {}

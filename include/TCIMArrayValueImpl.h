@@ -16,8 +16,8 @@ public:
   // The elements themselves, which can be edited in place even through a constant value. Edits are not checked.
   operator std::vector<TCIMValue>&() const override;
 
-  // "{ a, b }", each element printed with `radix`. An empty array prints "{", two blanks and "}". Strings are not quoted.
-  // Exceptions thrown by an element pass through, such as kZEPStatusValueIsNULL for a NULL element.
+  // "{ a, b }", with each element printed in `radix`. An empty array is printed as "{", two blanks and "}". Strings are not
+  // quoted. Exceptions thrown by an element pass through, such as kZEPStatusValueIsNULL for a NULL element.
   std::string ToString(unsigned char radix) const override;
 
   // True when `other` is an array with the same number of elements and each element equals its counterpart. Two empty arrays

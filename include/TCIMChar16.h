@@ -11,7 +11,7 @@ namespace NQRVZEP20 {
 
 class TCIMChar16Impl;
 
-// A CIM char16: one 16-bit character code. Its text is the code as a decimal number, not the character.
+// A CIM char16: one 16-bit character code. Its string form is the code as a decimal number, not the character.
 //
 // A plain value: copies are deep and share nothing. Not synchronised: use one object from one thread at a time.
 class ZEP_EXPORT TCIMChar16 {
@@ -19,7 +19,7 @@ public:
   TCIMChar16();  // code 0
   TCIMChar16(unsigned short code);
 
-  // Makes a NULL character, whatever the text is. Kept.
+  // Makes a NULL character, regardless of the text. Kept.
   TCIMChar16(std::string const& text);
 
   TCIMChar16(TCIMChar16 const& other);
@@ -31,9 +31,9 @@ public:
   // The code in decimal: 65 gives "65". Throws kZEPStatusInvalidDateTime for a NULL character.
   std::string ToString() const;
 
-  // Both return true for any two characters, whatever their codes are: any two characters are equal, and each is less than
-  // the other. Do not sort or deduplicate with these operators. Both throw kZEPStatusInvalidDateTime when either character is
-  // NULL. Kept.
+  // Both return true for any two characters, regardless of their codes: any two characters are equal, and each is less than
+  // the other. Do not sort or deduplicate with these operators. Both throw kZEPStatusInvalidDateTime when either character
+  // is NULL. Kept.
   bool operator==(TCIMChar16 const& other) const;
   bool operator<(TCIMChar16 const& other) const;
 

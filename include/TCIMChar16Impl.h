@@ -15,7 +15,7 @@ public:
   TCIMChar16Impl() noexcept = default;  // code 0
   TCIMChar16Impl(unsigned short code) noexcept : fCode(code) {}
 
-  // Makes a NULL character, whatever the text is. Kept.
+  // Makes a NULL character, regardless of the text. Kept.
   TCIMChar16Impl(std::string const& text) noexcept;
 
   unsigned short GetValue() const noexcept { return fCode; }
@@ -23,7 +23,7 @@ public:
   // The code in decimal. Throws kZEPStatusInvalidDateTime for a NULL character.
   std::string ToString() const;
 
-  // All four operators return true, whatever the codes are. They throw kZEPStatusInvalidDateTime when either character is
+  // All four operators return true, regardless of the codes. They throw kZEPStatusInvalidDateTime when either character is
   // NULL. Kept. An empty pointer is a failed assertion.
   bool operator==(TCIMChar16Impl const& other) const;
   bool operator<(TCIMChar16Impl const& other) const;

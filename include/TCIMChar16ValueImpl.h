@@ -16,7 +16,7 @@ public:
 
   operator TCIMChar16() const override;
 
-  // The code in decimal, whatever the radix is.
+  // The code in decimal, regardless of the radix.
   std::string ToString(unsigned char radix) const override;
 
   // Compare as TCIMChar16 does: any two characters are equal, and each is less than the other.

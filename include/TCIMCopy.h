@@ -28,17 +28,18 @@ class TCIMReference;
 // Copies the schema of one namespace into another, and the instances of QRVSG_ZEPProduct, the collector's own product record.
 // The two namespaces may belong to different plug-ins: the copy uses only the interfaces, with empty contexts.
 //
-// If copying a property declaration throws TZEPException, the copy logs that at debug severity and leaves the declaration
-// out. Any other exception passes through and ends the copy, for example because a class already exists, a superclass is
-// missing, or a static value belongs to a declaration that was left out. The elements created by then stay in the
-// destination. An empty pointer returned by the destination counts as if that call had thrown kZEPStatusNotFound; only
-// GetPropertyDecl may return one, for a property that is not declared yet. An empty pointer passed by the caller is a failed
-// assertion. Only CopyInstance takes a lock.
+// If copying a property declaration throws TZEPException, the copy logs that at debug severity and skips the declaration. Any
+// other exception passes through and ends the copy, for example because a class already exists, a superclass is missing, or a
+// static value belongs to a declaration that was skipped. The elements created by then remain in the destination. An empty
+// pointer returned by the destination is treated as if the call had thrown kZEPStatusNotFound; only GetPropertyDecl may
+// return one, for a property that is not declared yet. An empty pointer passed by the caller is a failed assertion. Only
+// CopyInstance takes a lock.
 class ZEP_EXPORT TCIMCopy {
 public:
   // Copies the qualifier declarations, then the classes that are not associations (ICIMClass::GetClassFlag), then the
-  // associations, whose referenced classes exist by then. Copies the instances of the class QRVSG_ZEPProduct itself, not of
-  // its subclasses, unless `noProductInstances` is true, the class is abstract, or it carries the qualifier PLUGINNAME.
+  // associations, because the classes that they refer to must exist. Copies the instances of the class QRVSG_ZEPProduct
+  // itself, not of its subclasses, unless `noProductInstances` is true, the class is abstract, or it has the qualifier
+  // PLUGINNAME.
   static void CopyClasses(boost::shared_ptr<ICIMNamespace> src, boost::shared_ptr<ICIMNamespace> dst, bool noProductInstances);
 
   // Copies one class with its qualifiers, declarations and static values, without instances. Its superclass and the qualifier

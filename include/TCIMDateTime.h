@@ -13,8 +13,8 @@ class TCIMDateTimeImpl;
 
 // A CIM datetime: a point in time with a UTC offset (a timestamp), or a length of time (an interval).
 //
-// A plain value: copies are deep and share nothing. A new one is NULL; printing, comparing or adding a NULL throws
-// kZEPStatusInvalidDateTime. Not synchronised: use one object from one thread at a time. Validation, comparison and
+// A plain value: copies are deep and share nothing. A default-constructed one is NULL; printing, comparing or adding a NULL
+// throws kZEPStatusInvalidDateTime. Not synchronised: use one object from one thread at a time. Validation, comparison and
 // arithmetic of timestamps use mktime and localtime of the C library and therefore depend on the time zone of the process.
 class ZEP_EXPORT TCIMDateTime {
 public:
@@ -30,7 +30,7 @@ public:
 
   // ---- Setting. A Set with invalid arguments throws kZEPStatusInvalidDateTime and keeps the old value. ----
 
-  // Reads the 25-character CIM text: "yyyymmddHHMMSS.mmmmmm+uuu" (or "-uuu"; minutes east of UTC) for a timestamp,
+  // Parses the 25-character CIM text: "yyyymmddHHMMSS.mmmmmm+uuu" (or "-uuu"; minutes east of UTC) for a timestamp,
   // "ddddddddHHMMSS.mmmmmm:000" for an interval.
   void Set(std::string const& text);
 
@@ -66,11 +66,12 @@ public:
 
   std::string ToString() const;  // the 25-character CIM text; longer when a field has too many digits
 
-  // A readable text: "03/15/2007 14:30:00" (no microseconds, no offset), or "2 days 1 hour 5 milliseconds " for an interval,
-  // with the trailing blank. The text of a zero interval is empty.
+  // A human-readable text: "03/15/2007 14:30:00" (no microseconds, no offset), or "2 days 1 hour 5 milliseconds " for an
+  // interval, with the trailing blank. The text of a zero interval is empty.
   std::string ToUIString() const;
 
-  // ---- Comparison. Timestamps are compared by the instant that they denote, then by microseconds; intervals by their length.
+  // ---- Comparison. Timestamps are compared by the instant that they represent, then by microseconds; intervals by their
+  // length.
   //      Throws kZEPStatusInvalidDateTime when either is NULL, or when one is a timestamp and the other an interval. ----
 
   bool operator==(TCIMDateTime const& other) const;

@@ -49,7 +49,7 @@ public:
   TCIMDateTimeImpl operator-(TCIMDateTimeImpl const& other) const;
 
 private:
-  // Turn a total in microseconds into the result of an operation.
+  // Convert a total in microseconds to the result of an operation.
   static TCIMDateTimeImpl IntervalOf(std::int64_t total);
   static TCIMDateTimeImpl TimestampOf(std::int64_t total, short utcOffset);
 

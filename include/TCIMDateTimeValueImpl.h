@@ -15,7 +15,8 @@ public:
 
   operator TCIMDateTime() const override;
 
-  // The CIM text, whatever the radix is. ToString and the comparisons throw kZEPStatusInvalidDateTime for a NULL datetime.
+  // The CIM text, regardless of the radix. ToString and the comparisons throw kZEPStatusInvalidDateTime for a NULL
+  // datetime.
   std::string ToString(unsigned char radix) const override;
 
   bool operator==(TCIMValue const& other) const override;

@@ -36,9 +36,9 @@ public:
   operator double() const override;
 
   // `radix` is 10, 16 or 8; any other value throws kZEPStatusNotSupported, for a boolean too. Unsigned integers can be
-  // printed in all three: base 16 uses capitals and pads with zeros to the width of the type, base 8 does not pad. Signed
-  // integers and reals can be printed in base 10 only and throw kZEPStatusNotSupported for 8 and 16. A boolean is printed as
-  // "true" or "false". A real is printed as printf prints it for %g: six significant digits, and a decimal point in any
+  // printed in all three: base 16 uses upper-case digits and is zero-padded to the width of the type, base 8 is not padded.
+  // Signed integers and reals can be printed in base 10 only and throw kZEPStatusNotSupported for 8 and 16. A boolean is
+  // printed as "true" or "false". A real is printed like printf's %g: six significant digits, with a decimal point in every
   // locale.
   std::string ToString(unsigned char radix) const override;
 

@@ -19,13 +19,13 @@ class ICIMElement;
 class ICIMNamespace;
 class TCIMReferenceImpl;
 
-// A CIM object path in parsed form: a namespace, a class and the key bindings.
+// A parsed CIM object path: a namespace, a class and the key bindings.
 //
 // The namespace is held by a weak pointer: a reference never keeps it alive. Copies are deep and share only the class and the
 // resolved element. Keys can be added only after a class has been set, and the class can be changed only while there are no
 // keys; any other order throws kZEPStatusInvalidOpSequence. Exceptions thrown by the namespace pass through unless a comment
-// says otherwise. A reference that was moved from can only be assigned to or destroyed; any other use is a failed assertion.
-// Not synchronised.
+// states otherwise. A moved-from reference can only be assigned to or destroyed; any other use is a failed assertion. Not
+// synchronised.
 class ZEP_EXPORT TCIMReference {
 public:
   // Creates a reference in the namespace `ns`, without a class and keys. `context` is passed to the namespace whenever a
@@ -44,15 +44,15 @@ public:
   // ---- Paths ----
 
   // Returns the class name and the keys, in byte order of their names, such as `X_Disk.Id="5",Name="a\"b"`. The namespace is
-  // not printed. Each quote and backslash in a value is escaped with a backslash, but the path of a reference value is
-  // printed without escaping. Kept.
+  // not included. Each quote and backslash in a value is escaped with a backslash, but the path of a reference value is not
+  // escaped. Kept.
   std::string GetPath() const;
 
-  // Reads a path. The reference must have a namespace that still exists, no class and no keys; otherwise throws
-  // kZEPStatusInvalidOpSequence. Keys are read only after a namespace prefix (`ns:X_Disk.Id="5"`), which is not stored;
-  // without a prefix the complete text is read as a class name. Kept. Malformed paths, unknown classes and keys, and
-  // references nested more than 100 deep are logged as errors and throw kZEPStatusInvalidReference; the parts read before the
-  // error stay set. If a key occurs twice, its first value counts.
+  // Parses a path. The reference must have a namespace that still exists, no class and no keys; otherwise throws
+  // kZEPStatusInvalidOpSequence. Keys are parsed only after a namespace prefix (`ns:X_Disk.Id="5"`), which is not stored;
+  // without a prefix the complete string is taken as a class name. Kept. Malformed paths, unknown classes and keys, and
+  // references nested more than 100 deep are logged as errors and throw kZEPStatusInvalidReference; the parts parsed before
+  // the error stay set. If a key occurs twice, its first value is used.
   void SetPath(std::string const& path);
 
   // ---- Parts ----
@@ -68,13 +68,13 @@ public:
   void SetClass(boost::shared_ptr<ICIMClass> cls);
   std::string GetClassName() const;  // a failed assertion when no class is set
 
-  // Looks the class up in the namespace and sets it. Throws boost::bad_weak_ptr when the namespace has been destroyed; the
-  // namespace throws kZEPStatusNotFound when it has no such class.
+  // Looks up the class in the namespace and sets it. Throws boost::bad_weak_ptr if the namespace has been destroyed; the
+  // namespace throws kZEPStatusNotFound if it has no such class.
   void SetClassName(std::string const& name);
 
   // Adds the value of a key. Logs an error and throws kZEPStatusTypeMismatch when the type of the value is not the declared
-  // type; throws kZEPStatusNotFound when the class has no such property. The first value of a name counts: a later one is
-  // silently ignored. Kept.
+  // type; throws kZEPStatusNotFound if the class has no such property. Only the first value for a name is used: a later one
+  // is silently ignored. Kept.
   void AddKeyValue(std::string const& name, TCIMValue const& value);
 
   // Calls `callback` with the name and value of each key, in byte order of the names, until a call returns false.
@@ -86,8 +86,8 @@ public:
   // ---- Resolving ----
 
   // Returns the class when `classOnly` is true or there are no keys; otherwise the instance that this path names in the
-  // namespace of the class. The instance is looked up until it is found, and then stored. Throws kZEPStatusNotFound when
-  // there is none.
+  // namespace of the class. Once the instance has been found, it is stored and not looked up again. Throws kZEPStatusNotFound
+  // if there is none.
   boost::shared_ptr<ICIMElement> GetCIMElement(bool classOnly) const;
 
   // ---- Comparison. Two references are equal when they have the same class object and equal keys. References with the same

@@ -26,8 +26,8 @@ public:
 
   void SetOwner(TCIMReference& owner) noexcept { fOwner = owner; }
 
-  // Reads `path` into `target`, starting at `pos`, and advances `pos` past the text that was read. If `pos` is not 0, it is
-  // the position of the opening quote of a reference that is a key value in an enclosing path; reading then stops at the
+  // Parses `path` into `target`, starting at `pos`, and advances `pos` past the text that was parsed. If `pos` is not 0, it
+  // is the position of the opening quote of a reference that is a key value in an enclosing path; parsing then stops at the
   // closing quote or at the end of the path. A missing closing quote is not detected.
   static void ParsePath(TCIMReferenceImpl& target, std::string const& path, std::size_t& pos);
   static void ParsePath(TCIMReference& target, std::string const& path, std::size_t& pos) {

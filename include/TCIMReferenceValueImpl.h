@@ -15,7 +15,7 @@ public:
 
   operator TCIMReference() const override;
 
-  // The path, whatever the radix is.
+  // The path, regardless of the radix.
   std::string ToString(unsigned char radix) const override;
 
   // Compare as TCIMReference does.

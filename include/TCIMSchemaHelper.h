@@ -12,9 +12,10 @@ namespace NQRVZEP20 {
 
 class ICIMNamespace;
 
-// Queries for the identity of a server, read from a namespace that a provider has filled. Static operations only; no state.
+// Queries for the identity of a server in a namespace that a provider has filled. All functions are static; there is no
+// state.
 //
-// Unless its comment says otherwise, a query reads one property of the only instance of its class. It throws
+// Unless its comment states otherwise, a query reads one property of the only instance of its class. It throws
 // kZEPStatusNotFound when the class or the property is missing or the class does not have exactly one instance. For a value
 // that is NULL it throws kZEPStatusValueIsNULL, and for a value that is not a string kZEPStatusTypeMismatch. Other exceptions
 // thrown by the namespace pass through.
@@ -50,17 +51,17 @@ public:
   static std::string GetRawMTMString(boost::shared_ptr<ICIMNamespace> ns);
 
   // The machine type and model in the product name, which has the form "Server X1-[1234ABC]-", "Server X1-[1234]-", "1234ABC"
-  // or "1234"; trailing blanks are ignored. The product names of a few older models have other forms, which are recognised,
-  // too. Throws kZEPStatusInvalidFormat for any other form, and kZEPStatusNotFound as GetRawMTMString does.
+  // or "1234"; trailing blanks are ignored. The product names of a few older models, which have other forms, are also
+  // recognised. Throws kZEPStatusInvalidFormat for any other form, and kZEPStatusNotFound as GetRawMTMString does.
   static std::string GetMTM(boost::shared_ptr<ICIMNamespace> ns);
   static std::string GetMachineType(boost::shared_ptr<ICIMNamespace> ns);  // the first 4 characters of GetMTM
   static std::string GetModelNumber(boost::shared_ptr<ICIMNamespace> ns);  // the last 3
 
-  // True when the first four characters are letters or digits; the rest is not examined. False for a shorter text.
+  // True if the first four characters are letters or digits; the rest is not examined. False for a shorter string.
   static bool IsValidMachineType(std::string const& text);
 
-  // True when IsValidMachineType(text) is true and the next three characters are letters, digits or blanks. False for a
-  // shorter text.
+  // True if IsValidMachineType(text) is true and the next three characters are letters, digits or blanks. False for a shorter
+  // string.
   static bool IsValidMTM(std::string const& text);
 
   // ---- Serial number ----
@@ -86,7 +87,7 @@ public:
   static std::string GetSystemProductName_vmwesxi(boost::shared_ptr<ICIMNamespace> ns);
   static std::string GetMTM_vmwesxi(boost::shared_ptr<ICIMNamespace> ns);  // the text between "-[" and "]-" in that name
 
-  // The last "LargeBuildNumber", a text or an integer, among the VMware_HypervisorSoftwareIdentity instances.
+  // The last "LargeBuildNumber", a string or an integer, among the VMware_HypervisorSoftwareIdentity instances.
   static std::string GetOperatingSystemName_vmwesxi(boost::shared_ptr<ICIMNamespace> ns);
 
   // The property "SerialNumber" of the last OMC_Chassis instance that has it; throws kZEPStatusNotFound when there is no

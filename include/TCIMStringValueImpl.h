@@ -15,10 +15,10 @@ public:
 
   operator std::string() const override;
 
-  // The text itself, neither quoted nor escaped, whatever the radix is.
+  // The text itself, neither quoted nor escaped, regardless of the radix.
   std::string ToString(unsigned char radix) const override;
 
-  // Compare the texts as unsigned bytes, so case matters. False for a value that is not a string.
+  // Compare the strings as unsigned bytes, so case matters. False for a value that is not a string.
   bool operator==(TCIMValue const& other) const override;
   bool operator<(TCIMValue const& other) const override;
 

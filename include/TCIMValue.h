@@ -55,8 +55,8 @@ public:
 
     TCIMType(ECIMType type) noexcept : fType(type) {}
 
-    // The type with that CIM name ("uint8", "string", ...), in any mix of upper and lower case. There is no array syntax. An
-    // unknown name is not an error: it gives the tag kCIMTypeInvalid.
+    // The type with that CIM name ("uint8", "string", ...), which is case-insensitive. There is no array syntax. An unknown
+    // name is not an error: it gives the tag kCIMTypeInvalid.
     TCIMType(std::string name);
 
     operator ECIMType() const noexcept { return fType; }
@@ -95,13 +95,13 @@ public:
   TCIMValue(TCIMReference& value);
   TCIMValue(TCIMType type, unsigned int maxArraySize, std::vector<TCIMValue> const& elements);
 
-  // A scalar read from text. `text` is not modified; `ns` is used for references only. Numbers are read in decimal, as a
-  // standard stream in the classic locale reads them: leading white space is skipped, and reading stops at the first
-  // character that cannot continue the number. A text without a number, or with a number that does not fit its type, gives 0.
-  // A negative number that is read as an unsigned type wraps around. uint8 and sint8 are read as 32-bit numbers and cut to 8
-  // bits without a range check. A boolean is the word "true" or "false"; anything else gives false. A char16 is a NULL
-  // character, whatever the text is (see TCIMChar16). Kept. Throws kZEPStatusTypeMismatch for tag 0, tags above 15 and
-  // arrays, kZEPStatusInvalidDateTime for a malformed datetime, and the exceptions of TCIMReference::SetPath for a malformed
+  // A scalar parsed from text. `text` is not modified; `ns` is used only for references. Numbers are parsed in decimal, as by
+  // a standard stream in the classic locale: leading white space is skipped, and parsing stops at the first character that
+  // cannot continue the number. A string without a number, or with a number that does not fit its type, gives 0. A negative
+  // number for an unsigned type wraps around. uint8 and sint8 are parsed as 32-bit numbers and truncated to 8 bits without a
+  // range check. A boolean is the word "true" or "false"; anything else gives false. A char16 is a NULL character, regardless
+  // of the text (see TCIMChar16). Kept. Throws kZEPStatusTypeMismatch for tag 0, tags above 15 and arrays,
+  // kZEPStatusInvalidDateTime for a malformed datetime, and the exceptions of TCIMReference::SetPath for a malformed
   // reference.
   TCIMValue(TCIMType type, std::string& text, boost::shared_ptr<ICIMNamespace> ns);
 
@@ -112,9 +112,9 @@ public:
   // ---- Assignment ----
 
   // Assignment first compares the two values with ==, whose exceptions pass through. If they are equal, nothing changes: the
-  // value keeps its own referenced class and maximum array size. Kept. Otherwise assignment copies the tag and the data; from
-  // an array also the maximum array size, from a reference also the referenced class. A value may be assigned from itself or
-  // from one of its own elements.
+  // target keeps its own referenced class and maximum array size. Kept. Otherwise assignment copies the tag and the data;
+  // from an array also the maximum array size, from a reference also the referenced class. A value may be assigned from
+  // itself or from one of its own elements.
   TCIMValue& operator=(TCIMValue const& other);
   TCIMValue& operator=(TCIMValue&& other);
   void Set(TCIMValue const& other);
@@ -185,7 +185,7 @@ public:
   operator std::vector<TCIMValue>&() const;
 
   // The value as text. `radix` is 8, 10 or 16; only unsigned integers can be printed with 8 and 16, and with 16 they have
-  // capital letters and are padded with zeros to the width of the type. Strings, datetimes, char16 and references ignore the
+  // upper-case digits and are zero-padded to the width of the type. Strings, datetimes, char16 and references ignore the
   // radix. Strings are neither quoted nor escaped; an array is printed as "{ a, b }". Throws kZEPStatusValueIsNULL for a NULL
   // value or element. For a boolean or a number, throws kZEPStatusNotSupported for any other radix, and for a signed integer
   // or a real also for 8 and 16.
@@ -243,7 +243,7 @@ private:
 // Writes the name that TCIMType::ToString returns; its exceptions pass through.
 ZEP_EXPORT std::ostream& operator<<(std::ostream& stream, TCIMValue::TCIMType const& type);
 
-// Named values that a caller passes along with an object model operation. Empty unless an operation says otherwise.
+// Named values that a caller passes to an operation of the object model. Usually empty.
 using TCIMContext = std::map<std::string, TCIMValue>;
 
 }  // namespace NQRVZEP20

@@ -12,9 +12,9 @@ namespace NQRVZEP20 {
 // The data of a TCIMValue that is not NULL. There is one derived class for each kind of data: numbers, strings, datetimes,
 // char16, references and arrays.
 //
-// Every conversion of this base class throws kZEPStatusTypeMismatch; a kind overrides those that it supports. An object is
-// not changed after construction (except the elements of a TCIMArrayValueImpl), so any number of threads may read it.
-// Callers use TCIMValue and seldom need this class.
+// Every conversion of this base class throws kZEPStatusTypeMismatch; a derived class overrides those that it supports. An
+// object does not change after construction (except the elements of a TCIMArrayValueImpl), so any number of threads may read
+// it. Callers use TCIMValue and rarely need this class.
 class ZEP_EXPORT TCIMValueImpl {
 public:
   virtual ~TCIMValueImpl() = default;

@@ -8,7 +8,7 @@
 
 namespace NQRVZEP20 {
 
-// String and path utilities. Static operations only; no state, any thread.
+// String and path utilities. All functions are static, stateless and thread-safe.
 class ZEP_EXPORT TCommUtil {
 public:
   TCommUtil() {}
@@ -26,7 +26,7 @@ public:
   static void MkDirHier(std::string const& path);
 
   // Returns the first line of `text` up to its first carriage return, without leading and trailing blanks. Blanks directly
-  // before the carriage return stay. Kept. Tabs do not count as blanks. The result is empty when the remaining text contains
+  // before the carriage return stay. Kept. Tabs are not treated as blanks. The result is empty if the remaining text contains
   // anything but ASCII letters, digits, punctuation and white space.
   static std::string RemoveSpaces(std::string text);
 };

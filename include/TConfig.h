@@ -16,9 +16,9 @@ namespace NQRVZEP20 {
 //   flag            a line without "=" is a key that maps to itself
 //
 // Nothing is stripped: blanks and carriage returns are part of the key or the value. A line whose key or value is empty is
-// skipped. Of two lines with the same key the first counts. No operation throws for a missing or malformed file. A missing or
-// empty file is logged as an error. A file that cannot be read to its end is also logged as an error, and none of its lines
-// is used. A file that cannot be opened, and lines that are not settings, are silently ignored. Kept.
+// skipped. If a key occurs more than once, its first line is used. No operation throws for a missing or malformed file. A
+// missing or empty file is logged as an error. A file that cannot be read to its end is also logged as an error, and none of
+// its lines is used. A file that cannot be opened, and lines that are not settings, are silently ignored. Kept.
 //
 // The library uses one TConfig, which reads the file on first use; a file created or changed later has no effect. The first
 // call of GetInstance must come from one thread, during start-up; afterwards any thread may read.
@@ -37,10 +37,10 @@ public:
   TConfig(TConfig const&) = delete;
   TConfig& operator=(TConfig const&) = delete;
 
-  // Reads the file and adds its settings; settings that already exist are not changed. An empty file counts as missing.
+  // Reads the file and adds its settings; settings that already exist are not changed. An empty file is treated as missing.
   void parseConfigFile();
 
-  // The value of a key, verbatim. A missing key is logged as an error and gives an empty text.
+  // The value of a key, verbatim. A missing key is logged as an error and gives an empty string.
   std::string getValue(std::string const& key);
 
   // Every key, in ascending byte order. When there are no settings at all, logs an error and returns an empty vector.

@@ -30,7 +30,7 @@ public:
   static void SetLogThreshold(EZEPLogSeverity threshold);
 
   // The directory in which Initialize creates log files, with its trailing slash. Initially
-  // "/var/log/QRV_Support/ZepDebugLog/". Any text is accepted.
+  // "/var/log/QRV_Support/ZepDebugLog/". Any string is accepted.
   static void SetLogFileDir(std::string directory);
   static std::string GetLogFileDir();
 
@@ -53,11 +53,11 @@ public:
   // called again.
   TZEPStatusCode Initialize(std::string name);
 
-  // Opens the file and writes the opening banner. A new file gets the permission bits 0600, whatever the umask, because
-  // entries at debug severity may contain passwords and the contents of files. An existing file keeps its bits and its owner;
-  // it is truncated, or appended to when the environment variable QRV_YBNQI_GUI_T is set to any value. Throws
-  // kZEPStatusAccessDenied for EACCES and kZEPStatusFileSystemError for any other failure. After a failure nothing is written
-  // until a later call succeeds. A stream opened by an earlier call stays open, unused. Kept.
+  // Opens the file and writes the opening banner. A new file gets the permission bits 0600, regardless of the umask,
+  // because entries at debug severity may contain passwords and the contents of files. An existing file keeps its bits and
+  // its owner; it is truncated, or appended to when the environment variable QRV_YBNQI_GUI_T is set to any value. Throws
+  // kZEPStatusAccessDenied for EACCES and kZEPStatusFileSystemError for any other failure. After a failure nothing is
+  // written until a later call succeeds. A stream opened by an earlier call stays open, unused. Kept.
   void SetLogFilename(std::string path) override;
 
   // ---- Writing ----
@@ -67,12 +67,12 @@ public:
   // memory-only. Then writes the entry, unless it is memory-only, to this thread's file, if there is one, in this form:
   //   FDR_[Status] 3/3/2024  9:5:7 message
   // A zero byte in the message ends the written line there, without a newline; the list holds the complete message. Kept.
-  // Throws kZEPStatusFail when a file is open and the severity is neither memory-only nor kLogError to kLogVerbose. A failing
-  // write is not reported.
+  // Throws kZEPStatusFail when a file is open and the severity is neither memory-only nor kLogError to kLogVerbose. Write
+  // errors are not reported.
   void OutputLogEntry(EZEPLogSeverity severity, std::string const& message) override;
 
-  // Writes the same line to the system log, whatever the threshold is; adds nothing to the list. Throws kZEPStatusFail when
-  // the severity is not kLogError to kLogVerbose.
+  // Writes the same line to the system log, regardless of the threshold; adds nothing to the list. Throws kZEPStatusFail
+  // when the severity is not kLogError to kLogVerbose.
   void SysLogEntry(EZEPLogSeverity severity, std::string const& message) override;
 
   // ---- The list ----

@@ -46,15 +46,15 @@ struct TRemovableMedium {
   std::string fMountPoint;   // "/mnt/key"; empty when mounting failed
 };
 
-// Every service of the operating system that the library uses. Static operations only. Each operation runs on the caller's
-// thread and blocks it until done; none takes a lock, except to log. Failures are thrown as TZEPException unless the comment
-// of an operation says otherwise.
+// All operating system services that the library uses. All functions are static. Each runs on the caller's thread and blocks
+// it until done; none takes a lock, except to log. Failures are thrown as TZEPException unless the comment of a function
+// states otherwise.
 class ZEP_EXPORT TOSSpecific {
 public:
   // ---- Files and directories (TOSSpecificFiles.cpp) ----
 
   // FileExists is true for anything that exists and is not a directory: devices, pipes and sockets count as files. DirExists
-  // is true for directories only. Both follow links.
+  // is true for directories only. Both follow symbolic links.
   static bool FileExists(std::string path);
   static bool DirExists(std::string path);
 
@@ -63,7 +63,7 @@ public:
   // kZEPStatusFileSystemError for any other failure.
   static int CreateDir(std::string path);
 
-  // The size in bytes. Throws kZEPStatusFileNotFound when FileExists is false or the file cannot be examined.
+  // The size in bytes. Throws kZEPStatusFileNotFound if FileExists is false or stat fails.
   static long GetFileSize(std::string path);
 
   // The names, not the paths, of all entries except "." and "..", in the order in which the system lists them. Throws
@@ -95,10 +95,10 @@ public:
   // kZEPStatusFileSystemError; the part already copied remains.
   static void FileCopy(std::string from, std::string to);
 
-  // Copies the files of a directory, following links, and with `recursive` also its subdirectories. `to` is created when it
-  // is missing, but its parents are not. An entry that cannot be examined, such as a dangling link, is skipped. Kept. Returns
-  // the result of closing the source directory, 0. Throws kZEPStatusFileSystemError when a directory cannot be opened;
-  // exceptions of CreateDir and FileCopy pass through. The files already copied remain.
+  // Copies the files of a directory, following symbolic links, and with `recursive` also its subdirectories. `to` is created
+  // when it is missing, but its parents are not. An entry that cannot be stat'ed, such as a dangling symbolic link, is
+  // skipped. Kept. Returns the result of closing the source directory, 0. Throws kZEPStatusFileSystemError when a directory
+  // cannot be opened; exceptions of CreateDir and FileCopy pass through. The files already copied remain.
   static int DirCopy(std::string from, std::string to, bool recursive);
 
   // ---- Paths and environment (TOSSpecificEnvironment.cpp) ----
@@ -107,7 +107,7 @@ public:
   static std::string GetCurrentDir();
 
   // The value of an environment variable. When the variable is not set, logs that at debug severity and returns an empty
-  // text. Does not throw.
+  // string. Does not throw.
   static std::string GetEnvironment(std::string name);
 
   // Sets an environment variable, replacing any earlier value. When setenv fails, for example for an invalid name, logs that
@@ -115,7 +115,7 @@ public:
   static bool PutEnvironment(std::string name, std::string value);
 
   // Joins `base` and `path`; returns `path` alone when it is absolute or `base` is empty. One trailing "/" is removed from
-  // `path` first, so the path "/" becomes empty and counts as relative. Kept.
+  // `path` first, so the path "/" becomes empty and is treated as relative. Kept.
   static std::string RelocateRelativePath(std::string base, std::string path);
 
   // True for the OEM variant of the collector: the file "docs/oem_zep_preboot_readme.txt" exists in the working directory.
@@ -139,14 +139,13 @@ public:
 
   // ---- Keyboard (TOSSpecificKeyboard.cpp) ----
 
-  // Whether standard input has data to read, such as a key press; also true when select fails. Kept. Never blocks. The local
-  // modes of the terminal (echo, waiting for Enter, signals from keys) are off during the call. Do not call it from two
-  // threads at once.
+  // Whether standard input has data to read, such as a key press; also true when select fails. Kept. Never blocks. Echo, line
+  // buffering and signal keys of the terminal are disabled during the call. Do not call it from two threads at once.
   static bool IsKeyWaiting();
 
-  // Waits for one character on standard input and returns it, or EOF at the end of the input and on error. The character is
-  // not echoed and Enter is not needed. It is read directly from the descriptor: data that std::cin or stdin has already
-  // buffered is not seen. Do not call it from two threads at once.
+  // Blocks until one character can be read from standard input and returns it, or EOF at the end of the input and on error.
+  // The character is not echoed and Enter is not needed. It is read directly from the descriptor: data that std::cin or stdin
+  // has already buffered is not seen. Do not call it from two threads at once.
   static int GetKeyboardChar();
 
   // ---- Console, time and host probes (TOSSpecificConsole.cpp) ----
@@ -166,7 +165,7 @@ public:
   // exists but cannot be read, the exceptions of CaptureFile pass through.
   static int GetRunningTypeOnXen();
 
-  // Runs the command "sh" with system(), waits until it ends, and returns the result of system().
+  // Runs the command "sh" with system(), waits until it exits, and returns the result of system().
   static int LaunchCommandShell();
 
   // Copies `argc` to `newArgc` and `argv` to `newArgv`; nothing is expanded on this platform.
@@ -186,26 +185,26 @@ public:
   // pthread_atfork handlers are not run. Kept. Several threads may run children at the same time; a stack of 32 KiB is
   // enough.
   //
-  // `timeout` is the longest silence allowed between two chunks of output, in seconds; it does not limit the total run time.
-  // -1 waits for ever. A child that writes nothing for longer is neither ended nor waited for. Kept.
+  // `timeout` is the longest silence allowed between two chunks of output, in seconds; it does not limit the total run
+  // time. -1 waits forever. A child that writes nothing for longer is neither killed nor waited for. Kept.
   //
   // Output is appended as it arrives. A zero byte discards the rest of the chunk (at most 4095 bytes) that contains it.
   // Kept.
   //
-  // The result is 0 when the child exited with 0, and -1 in every other case, also when the program could not be executed.
-  // The exit code itself is not returned. Kept. A select or waitpid that a signal interrupts is not retried. When the pipe's
-  // read end is a descriptor that select cannot watch (1024 and above), nothing is run and the result is -1. When no process
-  // can be created, an error is logged and a TZEPFailure with kZEPStatusFail is thrown.
+  // The result is 0 if the child exited with status 0, and -1 in every other case, including when the program could not be
+  // executed. The exit code itself is not returned. Kept. A select or waitpid that is interrupted by a signal is not retried.
+  // When the pipe's read end is a descriptor that select cannot watch (1024 and above), nothing is run and the result is -1.
+  // When no process can be created, an error is logged and a TZEPFailure with kZEPStatusFail is thrown.
 
   // Runs the file `path` with `argv0` as its name, the arguments `args`, and exactly the environment `env` (entries
   // "NAME=value").
   static int SpawnProcess(std::string const& path, std::vector<std::string> const& args, std::string const& argv0,
                           std::vector<std::string> const& env, std::string& output, int timeout);
 
-  // Runs `program`, searched on PATH, in the caller's environment.
+  // Runs `program`, which is searched for in PATH, in the caller's environment.
   static int SpawnProcess(std::string program, std::vector<std::string> args, std::string& output, int timeout);
 
-  // The same, but returns the output, whatever the result is.
+  // The same, but returns the output, regardless of the result.
   static std::string SpawnProcess(std::string program, std::vector<std::string> args, int timeout);
 
   // The same with a command line, which is split at every single blank: two blanks in a row, or one at the end, give an
@@ -219,17 +218,17 @@ public:
   // is logged as an error and leaves `contents` empty.
   static void CapFileViaProc(std::string program, std::vector<std::string> args, std::string fileName, std::string& contents);
 
-  // The complete contents of a file, which are also logged at debug severity. A file that cannot be opened is logged as an
-  // error and throws a TZEPFailure with kZEPStatusFileNotFound; a failing read is handled as in GetFileContents.
+  // The complete contents of a file, which are also logged at debug severity. If the file cannot be opened, logs an error and
+  // throws a TZEPFailure with kZEPStatusFileNotFound; a failed read is handled as in GetFileContents.
   static std::string CaptureFile(std::string path);
 
   // The complete contents of a file. A file that cannot be opened is logged in two lines at debug severity and gives an empty
-  // text. `logContents` and a failing read are handled as in GetFileContents.
+  // string. `logContents` and a failed read are handled as in GetFileContents.
   static std::string CaptureFileLoader(std::string path, bool logContents);
 
   // Everything from the current position of `fd` to the end of the file, zero bytes included. The descriptor stays open.
-  // `path` is used in messages only. With `logContents` the complete text is logged at debug severity. A failing read is
-  // logged at status severity and throws a TZEPFailure with kZEPStatusFileSystemError.
+  // `path` is only used in messages. With `logContents` the contents are logged at debug severity. A failed read is logged at
+  // status severity and throws a TZEPFailure with kZEPStatusFileSystemError.
   static std::string GetFileContents(int fd, std::string path, bool logContents);
 
   // Copies the file into the working directory, or to "/" when that cannot be determined, and opens the copy in vi: the name
@@ -285,18 +284,18 @@ public:
   static void LoadNSPLibrary(std::string baseName);
 
   // Loads "<root path>/lib<baseName>.nsc.so" and returns the consumer that its function <baseName>_CreateINamespaceConsumer
-  // creates; the caller owns the consumer. Fails as LoadPluginLibrary does; a missing function is logged as an error and
+  // creates; the caller owns the consumer. Fails as LoadPluginLibrary does; if the function is missing, logs an error and
   // throws a TZEPFailure with kZEPStatusNotFound, and the library stays loaded.
   static INamespaceConsumer* LoadNSCLibrary(std::string baseName);
 
   // ---- Machine identification (TOSSpecificMachine.cpp) ----
   //
-  // Each call reads SMBIOS again, through the platform library libsmbios.so, which is loaded when first needed. When a text
-  // cannot be read, the operation returns its default and logs the reason at debug severity; no operation throws.
+  // Each call reads SMBIOS again, through the platform library libsmbios.so, which is loaded on first use. If a string cannot
+  // be read, the function returns its default and logs the reason at debug severity; none of these functions throws.
   //
   // The product description is split at its first "-", wherever that is. Kept. "Server Q100 -[1234AB7]-" gives the name
   // "Server Q100 " with its trailing blank, the type "1234" and the model "AB7". "1234AB7" alone gives only the type. An
-  // incomplete type or model counts as missing.
+  // incomplete type or model is treated as missing.
 
   // One field of SMBIOS structure type 1. `key` is case-sensitive: "type" (the machine type; default "0000"), "name",
   // "model" or "SN" (the serial number; default of these three "Unknown"). Any other key gives "error param of
@@ -323,10 +322,10 @@ public:
 
   // ---- Remote identity (TOSSpecificRemote.cpp) ----
   //
-  // The identity of a remote server, read from the FRU data of its management controller with IPMI over the LAN (port 623)
+  // The identity of a remote server, read from the FRU data of its management controller with IPMI over LAN (UDP port 623)
   // through the platform library libipmiClient.so: serial number (GetRemoteMSN), machine type (GetRemoteMT) and model. Each
-  // call opens a session, which replaces the one that was open, and leaves it open. Kept. The result is empty when no session
-  // can be opened, and "N/A" when the query fails. Otherwise a serial number always has 7 characters and a machine type 4;
+  // call opens a session, which replaces the one that was open, and leaves it open. Kept. The result is empty if no session
+  // can be opened, and "N/A" if the query fails. Otherwise a serial number always has 7 characters and a machine type 4;
   // missing characters are zero bytes. Do not call these operations from two threads at once.
   static std::string GetRemoteMSN(std::string host, std::string user, std::string password);
   static std::string GetRemoteMT(std::string host, std::string user, std::string password);
@@ -345,14 +344,14 @@ public:
   // Uploads the file to the URL or, with `download`, downloads the URL into the file. The missing directories of the URL are
   // created on the server; a download from an FTP server creates them, too. Kept.
   //
-  // When the local file of a download already exists, the operation asks on standard output whether to overwrite it, until
-  // it reads "y", "Y", "n" or "N" from standard input. After "n" or "N", at the end of the input, and when the file cannot
-  // be deleted, it returns without a transfer and without an error. An empty download leaves no file. The received part of a
-  // broken download stays. Kept.
+  // When the local file of a download already exists, the operation asks on standard output whether to overwrite it, until it
+  // reads "y", "Y", "n" or "N" from standard input. After "n" or "N", at the end of the input, or if the file cannot be
+  // deleted, it returns without a transfer and without an error. An empty download leaves no file. If a download fails, the
+  // part received so far remains. Kept.
   //
   // Every failure is logged as an error and throws a TZEPFailure whose reason is that of the log line: with
-  // kZEPStatusLibCurlFailure when libcurl cannot be loaded or set up, or the file to upload cannot be opened; with
-  // kZEPStatusConnectionFailed when the host is unknown or cannot be connected to; with kZEPStatusAccessDenied for any other
+  // kZEPStatusLibCurlFailure if libcurl cannot be loaded or initialised, or the file to upload cannot be opened; with
+  // kZEPStatusConnectionFailed if the host is unknown or cannot be connected to; with kZEPStatusAccessDenied for any other
   // failure of the transfer, including a full local disk and a file to upload that cannot be read to its end (a directory, a
   // failing disk). The part of an upload that was sent before a failure stays on the server.
   static void CurlTransferFile(std::string url, std::string localFile, bool download);
@@ -382,8 +381,8 @@ public:
 
   // ---- Removable media and devices (TOSSpecificMedia.cpp) ----
   //
-  // The commands "mount" and "umount", run through the shell, mount and unmount devices. Names are put into the command line
-  // without quoting: check every name before passing it. Kept.
+  // The commands "mount" and "umount", run through the shell, mount and unmount devices. Names are inserted into the command
+  // line without quoting: check every name before passing it. Kept.
 
   // Mounts a device or, if that fails, its first partition (the device's name followed by "1"). Returns the mount point:
   // "/mnt/floppy" for exactly "/dev/floppy", "/dev/fd0" and "/dev/fd1", "/mnt/key" for any other device. When a device is
@@ -397,14 +396,14 @@ public:
 
   // Appends to `devices` the device files of the virtual devices that the management controller presents to this host, as the
   // program "hwinfo" reports them. `kind` is 0 for disks, 1 for CD-ROMs, 2 for keyboards, 3 for mice; for any other kind
-  // nothing is run. An alias in parentheses after a name ("/dev/sdc (/dev/sg3)") is removed; with `keepWhole` it stays, but
-  // not for CD-ROMs. Kept. Nothing is appended when hwinfo is missing. If it is silent for 300 seconds, only its output up to
-  // then is used.
+  // nothing is run. An alias in parentheses after a name ("/dev/sdc (/dev/sg3)") is removed; with `keepWhole` it stays,
+  // except for CD-ROMs. Kept. Nothing is appended if hwinfo is missing. If it is silent for 300 seconds, only its output up
+  // to then is used.
   static void getxBMCVirtualDevices(int kind, std::vector<std::string>& devices, bool keepWhole);
 
   // Finds the USB disks among the instances of the namespace's class QRVSG_SCSIDevice and mounts each as MountDevice does;
   // creates /mnt/key when it is missing. Returns the disks in the order of the instances. If the machine has a floppy drive,
-  // it follows as the last medium, with the mount point "/mnt/floppy", but is not mounted.
+  // it is returned as the last medium, with the mount point "/mnt/floppy", but is not mounted.
   //
   // A disk is an instance whose DeviceType is "Direct Access Device". Its DeviceID is its SCSI address, written
   // "host:channel:target:lun" as Linux does, or a generic SCSI node such as "/dev/sg2", which is queried for its address. Its
@@ -431,10 +430,10 @@ public:
   static void LogSELEvent(char const* text, ILogger::EZEPLogSeverity severity, int unused);
 
   // Marks the start of a debug session: creates or truncates the file "<path><machine type><local time>.log", such as
-  // "/tmp/zep_123420240303-090507.log" for the `path` "/tmp/zep_". A null `path` stands for "/var/log/QRV_Support/zep_", in
-  // the OEM variant for "/var/log/OEM_Support/zep_". The complete path is cut after 255 bytes. Nothing is written to the
-  // file, and a failure to create it is not reported. Kept. Then, if `level` is 0 to 4, sets the logger's threshold to it and
-  // returns true; any other level leaves the threshold unchanged and returns false.
+  // "/tmp/zep_123420240303-090507.log" for the `path` "/tmp/zep_". A null `path` means "/var/log/QRV_Support/zep_", in the
+  // OEM variant "/var/log/OEM_Support/zep_". The complete path is truncated to 255 bytes. Nothing is written to the file, and
+  // a failure to create it is not reported. Kept. Then, if `level` is 0 to 4, sets the logger's threshold to it and returns
+  // true; any other level leaves the threshold unchanged and returns false.
   static bool SetDebugLevel(int level, char* path);
 };
 

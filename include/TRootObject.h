@@ -9,15 +9,15 @@ namespace NQRVZEP20 {
 class IIPMILan;
 class ILogger;
 
-// Access to the objects of which the process has one, or one per thread. Static operations only.
+// Access to the objects that exist once per process or once per thread. All functions are static.
 class ZEP_EXPORT TRootObject {
 public:
   static boost::shared_ptr<INamespaceProviderManager> GetNamespaceProviderManager();
 
-  // The link to the management controller; null before IIPMILan::Initialize. The library owns it.
+  // The link to the management controller, which the library owns; null before IIPMILan::Initialize.
   static IIPMILan* GetipmiLanIns();
 
-  // The calling thread's logger. The library owns it; never null.
+  // The calling thread's logger, which the library owns; never null.
   static ILogger* GetCoreLogger();
 };
 

@@ -7,7 +7,7 @@
 
 namespace NQRVZEP20 {
 
-// The library's exception type. It carries one status code. Catch it by reference: `catch (TZEPException const& e)`.
+// The library's exception type, which has a status code. Catch it by reference: `catch (TZEPException const& e)`.
 class ZEP_EXPORT TZEPException : public std::exception {
 public:
   TZEPException(TZEPStatusCode code) noexcept : fStatusCode(code) {}

@@ -7,7 +7,7 @@
 
 namespace NQRVZEP20 {
 
-// The status codes of the library. Every TZEPException carries one of them.
+// The status codes of the library. Every TZEPException has one of them.
 enum EZEPStatusCode : int {
   kZEPStatusOK = 0,
   kZEPStatusNotImplemented,
@@ -52,7 +52,7 @@ enum EZEPStatusCode : int {
   kZEPStatusLuzFilecopyFailure,
   kZEPStatusTransferFailure,
   kZEPStatusCimomConnectFailure,
-  fdrStatusEnd  // not a status: the number of statuses above; its text is its own name
+  fdrStatusEnd  // not a status code, but the number of codes above; its text is its own name
 };
 
 // One status code as a value. It converts implicitly from an enumerator and can be compared with one. Any thread may read it.

@@ -3,7 +3,8 @@
 
 #include "loaders/TLoadedLibrary.h"
 
-// Transfers are limited to one protocol by options that every libcurl has; newer ones prefer others.
+// Transfers are limited to one protocol by options that every version of libcurl supports, although newer versions deprecate
+// them.
 #define CURL_DISABLE_DEPRECATION
 #include <curl/curl.h>
 
@@ -12,8 +13,8 @@
 
 namespace NQRVZEP20 {
 
-// The functions of libcurl that every transfer uses. libcurl is loaded, never linked: the first one that can be loaded, from the
-// directory of the core library or by the linker's search.
+// The functions of libcurl that every transfer uses. libcurl is loaded at run time, never linked: the first one that can be
+// loaded, from the directory of the core library or on the dynamic linker's search path.
 struct TCurlFunctions {
   decltype(curl_global_init)* fGlobalInit = nullptr;
   decltype(curl_easy_init)* fInit = nullptr;
@@ -34,15 +35,15 @@ struct TCurlMessages {
   char const* fErrorBuffer;
 };
 
-// One transfer by libcurl, which is loaded for it and unloaded with it: the handle is cleaned up, then libcurl itself, then
-// the library is closed. libcurl's global state belongs to the process: do not use two of these objects at once.
+// One transfer with libcurl. The constructor loads libcurl; the destructor cleans up the handle and libcurl's global state, and
+// unloads libcurl. The global state belongs to the process: do not use two of these objects at once.
 class TCurl {
 public:
   // Loads libcurl and sets the error buffer. A failure is logged as an error and throws TZEPFailure with
   // kZEPStatusLibCurlFailure.
   explicit TCurl(TCurlMessages const& messages);
 
-  // Numbers must be `long`; texts are copied by libcurl. A failure is logged as an error with that message and throws
+  // Numbers must be `long`; strings are copied by libcurl. A failure is logged as an error with that message and throws
   // TZEPFailure with kZEPStatusLibCurlFailure.
   template <class TValue>
   void Set(CURLoption option, TValue value, char const* message) {
@@ -51,7 +52,7 @@ public:
 
   CURLcode Perform() { return fLibrary->fPerform(fHandle.get()); }
 
-  // libcurl's text for a Perform that failed; may be empty.
+  // libcurl's error message after Perform has failed; may be empty.
   char const* ErrorText() const { return fErrorText; }
 
 private:
@@ -64,10 +65,10 @@ private:
   static TCurlFunctions const& Checked(TLoadedLibrary<TCurlFunctions> const& library, TCurlMessages const& messages);
   [[noreturn]] static void Fail(char const* message);
 
-  // In the order in which they are made; they are released in the opposite order.
+  // Constructed in this order and destroyed in reverse order.
   TLoadedLibrary<TCurlFunctions> const fLibrary;
   TGlobalState const fGlobalState;
-  char fErrorText[CURL_ERROR_SIZE] = "";  // libcurl does not always fill it
+  char fErrorText[CURL_ERROR_SIZE] = "";  // libcurl does not always set it
   std::unique_ptr<CURL, decltype(curl_easy_cleanup)*> const fHandle;
 };
 

@@ -10,11 +10,11 @@
 
 namespace NQRVZEP20 {
 
-// The platform library libipmiClient.so, for the rooms that talk to a management controller. It is loaded by its plain name
-// on first use and then stays loaded; as long as loading fails, each call tries again. A function that it lacks is missed when
-// it is called; the others can still be used. Exceptions thrown by the library pass through.
+// The platform library libipmiClient.so, for the rooms that talk to a management controller. It is loaded by its plain name on
+// first use and then stays loaded; while loading fails, each call tries again. If the library lacks a function, only calls of
+// that function fail. Exceptions thrown by the library pass through.
 
-// How a call of the library ended.
+// The result of a call of the library.
 struct TIpmiResult {
   TLoadOutcome fLoad;  // whether the function could be called
   int fCode = 0;       // returned by the function, if it was called; kIpmiClientOk or an error of the library

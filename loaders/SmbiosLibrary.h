@@ -20,12 +20,12 @@ struct TSmbiosFunctions {
   std::vector<TLibraryFunction> Table();
 };
 
-// The SMBIOS tables, open through libsmbios.so for as long as the object lives.
+// The SMBIOS tables, which libsmbios.so keeps open as long as the object exists.
 class TSmbiosTables {
 public:
   enum ELibraryLife {
-    kStaysLoaded,      // the library is loaded when first needed and then stays; while it fails to load, each object tries again
-    kClosedWithTables  // each object loads the library anew
+    kStaysLoaded,      // the library is loaded on first use and stays loaded; while loading fails, each object tries again
+    kClosedWithTables  // each object loads and unloads the library
   };
 
   // Opens the tables. Never throws.
@@ -37,7 +37,7 @@ public:
   // The library's status on opening; meaningless when the library could not be loaded.
   int OpenStatus() const { return fOpenStatus; }
 
-  // The errno that the library left on opening; 0 when it left none.
+  // The value of errno after opening; 0 if the library did not set it.
   int OpenError() const { return fOpenError; }
 
   // Whether the library returned a handle. A library may report success without returning one.

@@ -9,8 +9,8 @@
 
 namespace NQRVZEP20 {
 
-// A library that is opened on first use and then stays loaded to the end of the process. While it cannot be opened, each use
-// tries again. Any thread may use it at any time.
+// A library that is opened on first use and then stays loaded until the process ends. While it cannot be opened, each use tries
+// again. Thread-safe.
 template <class TFunctions>
 class TKeptLibrary {
 public:

@@ -9,18 +9,18 @@
 
 namespace NQRVZEP20 {
 
-// The search for a library: the names, in the order in which they are tried, and the mode of dlopen.
+// Where to find a library: the names, in the order in which they are tried, and the mode for dlopen.
 struct TLibraryPlace {
   std::vector<std::string> fNames;
   int fMode;
 };
 
-// How the opening of a library ended.
+// The result of opening a library.
 struct TLoadOutcome {
   enum EKind { kComplete, kNotLoaded, kFunctionMissing };
 
   EKind fKind = kComplete;
-  std::string fReason;  // of a failure; that of the dynamic linker, if it has one
+  std::string fReason;  // why it failed: the dynamic linker's message, if there is one
 
   explicit operator bool() const { return fKind == kComplete; }
 };
@@ -28,7 +28,7 @@ struct TLoadOutcome {
 // A row of a table of functions: the name of the function, and the pointer that receives its address.
 class TLibraryFunction {
 public:
-  enum ENeed { kRequired, kOptional };  // the pointer to an optional function is null when the library lacks it
+  enum ENeed { kRequired, kOptional };  // the pointer to an optional function is null if the library lacks it
 
   template <class TFunction>
   TLibraryFunction(char const* name, TFunction*& function, ENeed need = kRequired)
@@ -51,11 +51,11 @@ private:
   bool (*fFind)(void*, TLibraryFunction const&);
 };
 
-// Returns the library under the first of the names that can be loaded, if it has every function that the table requires, and
-// null otherwise. `outcome` receives the result.
+// Opens the library under the first name that can be loaded. Returns null if there is none, or if the library lacks a function
+// that the table requires. `outcome` receives the result.
 TSharedLibrary OpenLibrary(TLibraryPlace const& place, std::vector<TLibraryFunction> const& table, TLoadOutcome& outcome);
 
-// The status that represents the outcome in a log line.
+// The status code that represents the outcome in log lines.
 EZEPStatusCode StatusOf(TLoadOutcome const& outcome);
 
 // A library opened at run time, and its functions. The library is closed with the object.
@@ -76,7 +76,7 @@ class TLoadedLibrary {
 public:
   TLoadedLibrary() : fLibrary(OpenLibrary(TFunctions::Place(), fFunctions.Table(), fOutcome)) {}
 
-  // A library that is not complete is closed at once; its functions cannot be called.
+  // An incomplete library is closed immediately; its functions must not be called.
   TLoadOutcome const& Outcome() const { return fOutcome; }
 
   TFunctions const& operator*() const { return fFunctions; }

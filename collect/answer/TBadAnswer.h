@@ -5,7 +5,8 @@
 
 namespace NQRVZEP20 {
 
-// The bytes of an answer are not in the form of NamespaceBytes.h, or exceed its limits. The text states how, for people.
+// The received bytes do not have the format of NamespaceBytes.h, or exceed its limits. The message gives the details in
+// human-readable form.
 struct TBadAnswer : std::runtime_error {
   using std::runtime_error::runtime_error;
 };

@@ -9,11 +9,11 @@
 
 namespace NQRVZEP20 {
 
-// Reads what TByteWriter wrote, or any other bytes: every length is checked against the bytes that are left. All members throw
-// TBadAnswer when the bytes end too early. The bytes must outlive the reader and the texts that it returns.
+// Reads what TByteWriter wrote. The bytes need not be trusted: every length is checked against the number of remaining bytes.
+// All members throw TBadAnswer if the bytes end too early. The bytes must outlive the reader and the views that it returns.
 class TByteReader {
 public:
-  explicit TByteReader(std::string_view bytes, std::size_t at = 0);  // begins at a position up to the end
+  explicit TByteReader(std::string_view bytes, std::size_t at = 0);  // `at`: the start position, at most the size
 
   std::size_t At() const { return fAt; }
   std::size_t Left() const { return fBytes.size() - fAt; }
@@ -21,10 +21,11 @@ public:
   unsigned char Byte();
   std::uint64_t Number();
 
-  // A number that is at most `most`; `what` names it in the exception for a greater one.
+  // A number that is at most `most`; for a greater one, throws TBadAnswer with `what` as its name.
   std::uint64_t NumberUpTo(std::uint64_t most, char const* what);
 
-  // A number of elements, each of which has at least one byte: at most `most`, and at most the number of bytes that are left.
+  // The number of elements of a list: at most `most`, and at most the number of remaining bytes, because each element has at
+  // least one byte.
   std::size_t Count(std::uint64_t most, char const* what);
 
   template <class T>

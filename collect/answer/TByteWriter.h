@@ -8,13 +8,14 @@
 
 namespace NQRVZEP20 {
 
-// Writes numbers and texts one after the other. Numbers of a fixed width have the byte order of this machine, on which the reader
-// runs, too.
+// Appends numbers and strings to a buffer. Fixed-width numbers have the byte order of this machine, because the reader runs on
+// the same machine.
 class TByteWriter {
 public:
   void Byte(unsigned int value) { fBytes.push_back(static_cast<char>(value)); }  // its lowest eight bits
 
-  // 7 bits a byte, the lowest first; the highest bit of a byte states whether another one follows.
+  // A variable-length number (LEB128): 7 bits per byte, the lowest first; the highest bit of a byte states whether another byte
+  // follows.
   void Number(std::uint64_t value);
 
   template <class T>
@@ -28,7 +29,7 @@ public:
 
   std::string const& Bytes() const { return fBytes; }
   void Clear() { fBytes.clear(); }
-  void CutTo(std::size_t size) { fBytes.resize(size); }  // drops what was written after that size
+  void CutTo(std::size_t size) { fBytes.resize(size); }  // truncates the buffer
 
 private:
   std::string fBytes;

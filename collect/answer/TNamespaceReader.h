@@ -5,7 +5,7 @@
 
 namespace NQRVZEP20 {
 
-// Checks the bytes of a received namespace, and makes its elements.
+// Validates the bytes of a received namespace and creates its elements.
 class TNamespaceReader {
 public:
   explicit TNamespaceReader(boost::shared_ptr<TReceivedNamespace> ns);
@@ -39,8 +39,8 @@ private:
   TByteReader fReader;
   std::size_t fClassCount = 0;
   TValueChecker fChecker;
-  std::vector<std::size_t> fDepths;  // of the classes
-  std::size_t fElements = 0;         // counted by CountOf
+  std::vector<std::size_t> fDepths;  // the number of superclasses, by class
+  std::size_t fElements = 0;         // the sum of all results of CountOf
 };
 
 }  // namespace NQRVZEP20

@@ -11,12 +11,12 @@
 
 namespace NQRVZEP20 {
 
-// A class of a received namespace, or one outside it that a reference names.
+// A class of a received namespace, or a class outside it to which a reference refers.
 class TReceivedClass : public TReceivedElement<ICIMClass> {
 public:
   struct TFacts {
     std::size_t fNumber = 0;
-    bool fIsOutside = false;  // then the namespace has no such class, and the number has no meaning
+    bool fIsOutside = false;  // the class is not in the namespace, and fNumber has no meaning
     bool fIsAssociation = false;
     bool fIsAbstract = false;
     boost::weak_ptr<TReceivedClass> fSuperClass;
@@ -53,7 +53,8 @@ public:
 
   TFacts const& Facts() const { return fFacts; }
   std::vector<boost::shared_ptr<TReceivedPropertyDecl>> const& PropertyDecls() const { return fPropertyDecls; }
-  boost::shared_ptr<TReceivedPropertyDecl> FindPropertyDecl(std::string const& name) const;  // its own; empty when there is none
+  boost::shared_ptr<TReceivedPropertyDecl> FindPropertyDecl(
+      std::string const& name) const;  // of this class; empty if there is none
   void Add(boost::shared_ptr<TReceivedPropertyDecl> property) { fPropertyDecls.push_back(property); }
   void Add(boost::shared_ptr<TReceivedMethodDecl> method) { fMethodDecls.push_back(method); }
   void Add(boost::shared_ptr<TReceivedProperty> staticProperty) { fStaticProperties.push_back(staticProperty); }
@@ -64,7 +65,7 @@ private:
   std::vector<boost::shared_ptr<TReceivedPropertyDecl>> fPropertyDecls;
   std::vector<boost::shared_ptr<TReceivedMethodDecl>> fMethodDecls;
   std::vector<boost::shared_ptr<TReceivedProperty>> fStaticProperties;
-  std::optional<TRecordedFailure> fStaticFailure;  // after the static properties
+  std::optional<TRecordedFailure> fStaticFailure;  // thrown after the static properties
 };
 
 }  // namespace NQRVZEP20

@@ -13,7 +13,7 @@ namespace NQRVZEP20 {
 
 class TReceivedNamespace;
 
-// A received namespace does not change. Throws kZEPStatusNotSupported.
+// Throws kZEPStatusNotSupported, because a received namespace is immutable.
 [[noreturn]] void RefuseChange();
 
 // The name and the qualifiers of a received element. `TInterface` is the element's own interface, which derives from

@@ -10,7 +10,8 @@ namespace NQRVZEP20 {
 class TReceivedNamespace;
 struct TReceivedLayout;
 
-// An instance of a received namespace. It holds only positions of the bytes: property values are read when they are needed.
+// An instance of a received namespace. It stores only a position in the serialised bytes: property values are decoded when they
+// are read.
 class TReceivedInstance : public ICIMInstance {
 public:
   // `layout` belongs to the namespace.
@@ -23,7 +24,7 @@ public:
                            TCIMContext const& context) const override;
   TCIMReference GetPath(TCIMContext const& context) const override;
 
-  TReceivedLayout const& Layout() const { return *fLayout; }  // as long as the namespace exists
+  TReceivedLayout const& Layout() const { return *fLayout; }  // valid as long as the namespace exists
 
 private:
   boost::weak_ptr<TReceivedNamespace> const fNamespace;

@@ -9,10 +9,10 @@
 
 namespace NQRVZEP20 {
 
-// What instances of one class share: the properties in their order.
+// The properties, in order, that instances of one class share.
 struct TReceivedLayout {
-  std::size_t fClass = 0;                         // its number
-  std::optional<TRecordedFailure> fClassFailure;  // thrown by GetClass instead
+  std::size_t fClass = 0;                         // the index of the class
+  std::optional<TRecordedFailure> fClassFailure;  // if set, GetClass throws it
   std::vector<TReceivedPropertyName> fProperties;
 };
 

@@ -21,7 +21,7 @@ public:
                                TCIMContext const& context) const override;
   boost::weak_ptr<ICIMNamedElement> GetOwner(TCIMContext const& context) const override;
 
-  // While the namespace is read.
+  // Called only while the namespace is being read.
   void Add(boost::shared_ptr<TReceivedParameterDecl> parameter) { fParameters.push_back(parameter); }
 
 private:

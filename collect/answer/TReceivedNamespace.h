@@ -20,17 +20,17 @@
 
 namespace NQRVZEP20 {
 
-// A namespace that was received as bytes (NamespaceBytes.h). It answers as the provider did when it was written, and throws what
-// the provider threw. Every operation that would change it throws kZEPStatusNotSupported.
+// A namespace that was received in serialised form (NamespaceBytes.h). Its operations return what those of the provider
+// returned when it was serialised, and throw what they threw. Operations that would change it throw kZEPStatusNotSupported.
 //
-// The bytes are checked once, completely: later reads stay within them, whatever they contain. They are kept, and values are read
-// when they are needed, so a namespace takes little more memory than its bytes. An element that outlives its namespace throws
+// The bytes are validated completely by From, so later reads never leave them. They are kept, and values are decoded when they
+// are read, so a namespace takes little more memory than its bytes. An element that outlives its namespace throws
 // boost::bad_weak_ptr. Use it from one thread at a time.
 class TReceivedNamespace : public ICIMNamespace,
                            public TReadingNamespace,
                            public boost::enable_shared_from_this<TReceivedNamespace> {
 public:
-  // Throws TBadAnswer for bytes that are not a namespace, or exceed the limits (AnswerLimits.h).
+  // Throws TBadAnswer if the bytes are not a serialised namespace or exceed the limits (AnswerLimits.h).
   static boost::shared_ptr<TReceivedNamespace> From(std::string bytes);
 
   std::string GetName(TCIMContext const& context) const override;
@@ -48,7 +48,7 @@ public:
 
   // ---- For its elements ----
 
-  TCIMValue ValueAt(std::size_t at) const;  // or throws the failure that is in its place
+  TCIMValue ValueAt(std::size_t at) const;  // throws the recorded failure if there is no value
   TByteReader ReaderAt(std::size_t at) const { return TByteReader(fBytes, at); }
   std::vector<boost::shared_ptr<TReceivedClass>> ClassesBelow(std::size_t number) const;
   void VisitInstances(std::size_t cls, boost::function<bool(boost::shared_ptr<ICIMInstance>)> const& callback) const;
@@ -67,10 +67,10 @@ private:
     std::optional<TRecordedFailure> fFailure;
   };
 
-  using TByKeys = std::unordered_map<std::string, boost::shared_ptr<TReceivedInstance>>;  // by KeyText of the path
+  using TByKeys = std::unordered_map<std::string, boost::shared_ptr<TReceivedInstance>>;  // by KeyText of their paths
 
   explicit TReceivedNamespace(std::string bytes) : fBytes(std::move(bytes)) {}
-  TByKeys const& InstancesByKeys(std::size_t cls) const;  // of exactly that class
+  TByKeys const& InstancesByKeys(std::size_t cls) const;  // only those of exactly that class
   std::size_t RootOf(std::size_t cls) const;
   std::vector<bool> IsInTreeOf(std::size_t cls) const;  // by class
 
@@ -78,15 +78,15 @@ private:
   std::string fName;
   std::vector<boost::shared_ptr<TReceivedQualifierDecl>> fQualifierDecls;
   std::vector<boost::shared_ptr<TReceivedClass>> fClasses;
-  std::vector<std::size_t> fSupers;  // the number of the superclass plus 1, or 0; by class
+  std::vector<std::size_t> fSupers;  // by class: the index of the superclass plus 1, or 0
   std::unordered_map<std::string, std::size_t, TNameHash, TNameEqual> fNumbers;
   std::optional<TRecordedFailure> fClassesFailure;
-  std::deque<TReceivedPropertyName> fStaticProperties;  // of all classes; their addresses are fixed
-  std::deque<TReceivedLayout> fLayouts;                 // the same
+  std::deque<TReceivedPropertyName> fStaticProperties;  // of all classes; a deque, so that addresses are stable
+  std::deque<TReceivedLayout> fLayouts;                 // a deque for the same reason
   std::vector<boost::shared_ptr<TReceivedInstance>> fInstances;
   std::map<std::size_t, TTree> fTrees;  // by the number of the root class
 
-  mutable std::map<std::size_t, TByKeys> fByKeys;                             // by class; of those that were searched
+  mutable std::map<std::size_t, TByKeys> fByKeys;                             // by class; filled on the first search
   mutable std::map<std::string, boost::shared_ptr<TReceivedClass>> fOutside;  // by lower-case name
 };
 

@@ -13,26 +13,26 @@ namespace NQRVZEP20 {
 class TReceivedNamespace;
 class TReceivedPropertyDecl;
 
-// The name of a property, and its declaration, which is empty when no class of the namespace declares it.
+// The name of a property, and its declaration, which is empty if no class of the namespace declares it.
 struct TReceivedPropertyName {
   std::string fName;
   boost::shared_ptr<TReceivedPropertyDecl const> fDeclaration;
 };
 
-// A property of an instance or class of a received namespace, whose value is at a position of the bytes.
+// A property of an instance or class of a received namespace. It stores the position of the value in the serialised bytes.
 class TReceivedProperty : public ICIMProperty {
 public:
-  // `name` belongs to the namespace.
+  // `name` is owned by the namespace.
   TReceivedProperty(boost::weak_ptr<TReceivedNamespace> ns, TReceivedPropertyName const& name, std::size_t at)
       : fNamespace(std::move(ns)), fName(&name), fAt(at) {}
 
-  // Throws the exception of the provider when it could not give the value.
+  // Throws the provider's exception if the provider threw one instead of returning the value.
   TCIMValue GetValue(TCIMContext const& context) const override;
 
   void SetValue(TCIMValue const& value, TCIMContext const& context) override;
   std::string GetName(TCIMContext const& context) const override;
 
-  // Throws kZEPStatusNotFound when no class of the namespace declares the property.
+  // Throws kZEPStatusNotFound if no class of the namespace declares the property.
   boost::shared_ptr<ICIMPropertyDecl const> GetDeclaration(TCIMContext const& context) const override;
 
 private:

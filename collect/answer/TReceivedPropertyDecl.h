@@ -18,8 +18,8 @@ public:
     TCIMValue::TCIMType fType = TCIMValue::TCIMType::kCIMTypeInvalid;
     std::size_t fDefaultAt = 0;  // the position of the default value in the bytes, or kNoDefault
     bool fIsKey = false;
-    std::optional<TRecordedFailure> fKeyFailure;  // thrown by IsKey instead
-    boost::weak_ptr<ICIMNamedElement> fOwner;     // empty when the provider states none
+    std::optional<TRecordedFailure> fKeyFailure;  // if set, IsKey throws it
+    boost::weak_ptr<ICIMNamedElement> fOwner;     // empty if the provider reported none
   };
 
   TReceivedPropertyDecl(boost::weak_ptr<TReceivedNamespace> ns, std::string name, TFacts facts);

@@ -10,7 +10,7 @@ namespace NQRVZEP20 {
 
 class TReceivedNamespace;
 
-// A qualifier of a received namespace, whose value is at a position of the bytes.
+// A qualifier of a received namespace. It stores the position of the value in the serialised bytes.
 class TReceivedQualifier : public ICIMQualifier {
 public:
   // `declaration` may be empty.

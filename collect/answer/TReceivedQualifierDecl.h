@@ -11,7 +11,7 @@ namespace NQRVZEP20 {
 
 class TReceivedNamespace;
 
-// A qualifier declaration of a received namespace, whose default value is at a position of the bytes.
+// A qualifier declaration of a received namespace. It stores the position of the default value in the serialised bytes.
 class TReceivedQualifierDecl : public ICIMQualifierDecl {
 public:
   TReceivedQualifierDecl(boost::weak_ptr<TReceivedNamespace> ns, std::string name, TCIMValue::TCIMType type, unsigned int scope,

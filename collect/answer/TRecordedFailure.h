@@ -8,23 +8,23 @@ namespace NQRVZEP20 {
 class TByteReader;
 class TByteWriter;
 
-// An exception as a value, so that it can be written in one process and thrown again in another: a TZEPException with its code,
-// a TZEPFailure also with its reason, any other std::exception with its text, or something else.
+// A record of an exception, which can be written in one process and thrown in another: a TZEPException with its code, a
+// TZEPFailure also with its reason, any other std::exception with its message, or an exception of any other type.
 class TRecordedFailure {
 public:
-  static TRecordedFailure OfCurrentException();  // call it in a handler; passes on std::bad_alloc
+  static TRecordedFailure OfCurrentException();  // call it in a catch block; rethrows std::bad_alloc
   static TRecordedFailure ReadFrom(TByteReader& reader);
   void WriteTo(TByteWriter& writer) const;
 
-  // Throws a TZEPException, a TZEPFailure, a std::runtime_error with the text, or something that is not a std::exception.
+  // Throws a TZEPException, a TZEPFailure, a std::runtime_error with the message, or an object that is not a std::exception.
   [[noreturn]] void Throw() const;
 
 private:
   enum EKind : unsigned char { kStatus, kStatusWithReason, kText, kOther };
 
   EKind fKind = kOther;
-  int fCode = 0;      // of a TZEPException
-  std::string fText;  // the reason, or the text of another exception
+  int fCode = 0;      // the code of a TZEPException
+  std::string fText;  // the reason, or the message of another exception
 };
 
 }  // namespace NQRVZEP20

@@ -12,21 +12,21 @@
 
 namespace NQRVZEP20 {
 
-// One value as bytes: the type tag, whether it is NULL, and the data to the last bit; for an array also the bound, for a
-// reference the class, the label and the keys, and for a NULL reference the referenced class. A class of the same namespace is
-// written as its number, any other as its name.
+// The serialised form of a value: the type tag, whether it is NULL, and the data, without loss of precision; for an array also
+// the bound, for a reference the class, the label and the keys, and for a NULL reference the referenced class. A class of the
+// same namespace is written as its index, any other as its name.
 
 using TClassNumbers = std::map<std::string, std::size_t>;  // by lower-case name
 
-// Throws TBadAnswer for references that are nested too deeply (AnswerLimits.h).
+// Both throw TBadAnswer for references that are nested too deeply (AnswerLimits.h).
 void WriteValue(TByteWriter& writer, TCIMValue const& value, TClassNumbers const& classes);
 void WriteReference(TByteWriter& writer, TCIMReference const& reference, TClassNumbers const& classes);
 
-// Marks a value that could not be had; the failure follows it.
+// Writes a mark for a value that could not be read; the failure must follow it.
 void WriteMissingValue(TByteWriter& writer);
 bool IsMissingValue(TByteReader& reader);  // reads the mark, if there is one
 
-// Checks the form of the value that follows, and skips it. `values` counts the values. Throws TBadAnswer.
+// Validates the next value and skips it. Counts the values. Throws TBadAnswer if the value is malformed or exceeds a limit.
 class TValueChecker {
 public:
   explicit TValueChecker(std::size_t classes) : fClasses(classes) {}
@@ -41,23 +41,23 @@ private:
   std::uint64_t fValues = 0;
 };
 
-// Skips a value that was checked.
+// Skips a value that has been validated.
 void SkipValue(TByteReader& reader);
 
-// The namespace that the values are read into.
+// The namespace to which the values that are read belong.
 class TReadingNamespace {
 public:
   virtual ~TReadingNamespace() = default;
   virtual boost::shared_ptr<ICIMNamespace> Namespace() const = 0;
   virtual boost::shared_ptr<ICIMClass> ClassAt(std::size_t number) const = 0;
 
-  // A class of another namespace, of which only the name and the declarations of these keys are known.
+  // A class of another namespace, of which only the name and the key declarations added by DeclareOutside are known.
   virtual boost::shared_ptr<ICIMClass> OutsideClass(std::string const& name) const = 0;
   virtual void DeclareOutside(boost::shared_ptr<ICIMClass> const& cls, std::string const& key, TCIMValue const& value) const = 0;
 };
 
-// Read a value or reference that was checked. They throw kZEPStatusInvalidDateTime for a datetime that the time zone of this
-// process does not have, and the exceptions of TCIMReference::AddKeyValue.
+// Read a value or reference that has been validated. Both throw kZEPStatusInvalidDateTime for a datetime that is not valid in
+// the time zone of this process, and the exceptions of TCIMReference::AddKeyValue.
 TCIMValue ReadValue(TByteReader& reader, TReadingNamespace const& ns);
 TCIMReference ReadReference(TByteReader& reader, TReadingNamespace const& ns);
 

@@ -11,13 +11,13 @@ struct TPipe {
   TUniqueFd fReadEnd, fWriteEnd;
 };
 
-// Throws std::system_error when there is no pipe. The read end does not block.
+// Throws std::system_error if no pipe can be created. The read end is non-blocking.
 TPipe OpenPipe();
 
-// Closes every descriptor of this process from 3 up, except these.
+// Closes all descriptors of this process from 3 up, except `kept`.
 void CloseAllBut(std::vector<int> kept);
 
-// Makes a descriptor the null device, for reading and writing.
+// Redirects the descriptor to the null device, for reading and writing.
 void MakeNull(int fd);
 
 }  // namespace NQRVZEP20

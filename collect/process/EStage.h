@@ -3,12 +3,12 @@
 
 namespace NQRVZEP20 {
 
-// What a plug-in is doing.
+// The stages in the life of a plug-in.
 enum class EStage : unsigned char {
-  kOpen,          // its file is opened, and its symbols are resolved
+  kOpen,          // its file is opened and its symbols are resolved
   kConstruction,  // its static objects are constructed
-  kRegistration,  // its provider is registered
-  kFill           // a namespace is filled and written
+  kRegistration,  // a provider registers itself
+  kFill           // a namespace is filled and serialised
 };
 
 inline char const* NameOf(EStage stage) {

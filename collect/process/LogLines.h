@@ -14,11 +14,11 @@ struct TLogLine {
   std::string fMessage;
 };
 
-// The entries of the text of a log file (docs/formats.md), without banners. A line that does not begin like an entry belongs to
-// the message before it.
+// Parses the text of a log file (docs/formats.md) into its entries, without banners. A line that does not begin like an entry
+// is a continuation of the previous message.
 std::vector<TLogLine> LogLinesOf(std::string const& text);
 
-// "[Error] no disk", the first line of the message only; empty for no entry.
+// The last entry, with only the first line of its message: "[Error] no disk". Empty if there is no entry.
 std::string LastLogLineOf(std::string const& text);
 
 }  // namespace NQRVZEP20

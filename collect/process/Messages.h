@@ -8,18 +8,18 @@
 
 namespace NQRVZEP20 {
 
-// The messages that the process of a plug-in sends: a byte for the kind, four for the length of the text, and the text.
+// The messages that a plug-in process sends: one byte for the kind, four bytes for the length of the text, and the text.
 enum class EMessage : unsigned char {
-  kStage,       // a stage of the load begins: a byte, an EStage
-  kRegistered,  // a provider was registered: its name
-  kTaken,       // a provider was not registered, because another one has its name: the name
-  kLoaded,      // the load has ended: its milliseconds, as text
+  kStage,       // a stage of loading begins: one byte, an EStage
+  kRegistered,  // a provider has been registered: its name
+  kTaken,       // a provider has not been registered, because its name is taken: the name
+  kLoaded,      // loading has ended: the time in milliseconds, as text
   kFilling,     // a provider begins to fill its namespace: its name
-  kBytes,       // a piece of its namespace (NamespaceBytes.h)
-  kFilled,      // the namespace is complete: the milliseconds to fill it, as text
-  kFailed,      // the load, or the provider, failed: why. What follows is about the next provider
-  kFatal,       // the same, and the process ends
-  kExits,       // the plug-in called exit: the status, as text
+  kBytes,       // a chunk of the serialised namespace (NamespaceBytes.h)
+  kFilled,      // the namespace is complete: the time to fill it in milliseconds, as text
+  kFailed,      // loading, or the provider, has failed: why. Later messages are about the next provider
+  kFatal,       // the same, but the process ends
+  kExits,       // the plug-in has called exit: the status, as text
   kDone         // nothing more follows; the last kind
 };
 
@@ -29,12 +29,12 @@ struct TMessage {
 };
 
 constexpr std::size_t kMessageHead = 5;
-constexpr std::size_t kLongestMessage = 1024 * 1024;  // its text
+constexpr std::size_t kLongestMessage = 1024 * 1024;  // the limit for the text, in bytes
 
-// The head of a message with a text of that length, at most kLongestMessage.
+// The header of a message with a text of `length` bytes, which must be at most kLongestMessage.
 std::string HeadOf(EMessage kind, std::size_t length);
 
-// Puts messages together from pieces of any size. After wrong bytes, IsBad is true and Next returns nothing.
+// Reassembles messages from chunks of any size. After malformed data, IsBad is true and Next returns nothing.
 class TMessageReader {
 public:
   void Add(std::string_view bytes) { fBytes.append(bytes); }
@@ -43,7 +43,7 @@ public:
 
 private:
   std::string fBytes;
-  std::size_t fAt = 0;  // of the next message
+  std::size_t fAt = 0;  // the position of the next message
   bool fIsBad = false;
 };
 

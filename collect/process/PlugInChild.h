@@ -6,20 +6,20 @@
 
 namespace NQRVZEP20 {
 
-// What the process of a plug-in works with.
+// The parameters of a plug-in process.
 struct TChildSetup {
-  std::string fName;           // of the plug-in, for TOSSpecific::LoadNSPLibrary
-  std::string fFile;           // its path
-  int fAnswer;                 // the descriptor that gets the messages (Messages.h)
-  int fWords;                  // that becomes standard output and standard error
-  int fLog;                    // that gets the lines of the log
-  std::uint64_t fMemoryBytes;  // that the process may use in addition; 0: any number
+  std::string fName;           // the plug-in's base name, for TOSSpecific::LoadNSPLibrary
+  std::string fFile;           // the plug-in's path
+  int fAnswer;                 // the descriptor to which the messages (Messages.h) are written
+  int fWords;                  // the descriptor for standard output and standard error
+  int fLog;                    // the descriptor to which the log is written
+  std::uint64_t fMemoryBytes;  // the memory that the process may use in addition; 0: no limit
 };
 
-// Loads the plug-in in this process, has its providers fill their namespaces, and sends everything. Ends the process.
+// Loads the plug-in into this process, calls its providers to fill their namespaces, and sends the result. Then exits.
 //
-// Standard input is the null device, no other descriptors are open, the log goes to `fLog`, and no core dump is written. Handlers
-// that were registered with atexit before do not run, even when the plug-in calls exit.
+// Standard input is the null device, no other descriptors are open, the log goes to `fLog`, and no core dump is written.
+// Handlers that were registered with atexit before this call do not run, even if the plug-in calls exit.
 [[noreturn]] void RunPlugIn(TChildSetup const& setup);
 
 }  // namespace NQRVZEP20

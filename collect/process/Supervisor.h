@@ -5,24 +5,24 @@
 
 namespace NQRVZEP20 {
 
-// What became of the process of a plug-in.
+// How a plug-in process ended.
 struct TVerdict {
-  int fStatus;             // as waitpid gives it
-  bool fHadEndedByItself;  // before the supervisor was told to end it
+  int fStatus;             // the wait status, as returned by waitpid
+  bool fHadEndedByItself;  // it ended before the supervisor was told to kill it
 };
 
 // The descriptors of a supervisor.
 struct TSupervisorEnds {
-  int fControl;  // of a pipe that the owner holds open as long as the plug-in may work
-  int fVerdict;  // of a pipe that gets a TVerdict
+  int fControl;  // the read end of a pipe that the owner keeps open as long as the plug-in may run
+  int fVerdict;  // the write end of a pipe to which a TVerdict is written
 };
 
-// The life of a supervisor, the process between the owner and a plug-in. It runs `work` in a child, waits until that has ended or
-// the pipe of `control` is closed, ends the child and every process that it started, sends the verdict, and ends. The system
-// closes the pipe when the owner dies in any way, so no process of a plug-in outlives the owner.
+// The main function of a supervisor, the process between the owner and a plug-in. Runs `work` in a child, waits until the child
+// has ended or the owner has closed the control pipe, kills the child and all processes that it started, sends the verdict, and
+// exits. The kernel closes the pipe if the owner dies for any reason, so no process of a plug-in outlives the owner.
 //
-// Supervisor and child have sessions of their own: a Ctrl-C on the terminal reaches neither. In the child, all signals have their
-// default effect and none is blocked; `work` closes the descriptors that are not its own.
+// Supervisor and child each have a session of their own, so a Ctrl-C on the terminal reaches neither. In the child, all signals
+// have their default disposition and none is blocked; `work` must close the descriptors that it does not need.
 [[noreturn]] void Supervise(TSupervisorEnds const& ends, std::function<void()> const& work);
 
 }  // namespace NQRVZEP20

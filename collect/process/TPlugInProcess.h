@@ -19,27 +19,27 @@
 
 namespace NQRVZEP20 {
 
-// The process of one plug-in, seen from its owner, with the supervisor between them. The owner polls its descriptors and calls
-// Follow. A process that still works when its owner is destroyed is ended. The caller has a single thread.
+// The owner's handle for the process of one plug-in and its supervisor. The owner polls the descriptors and calls Follow. If
+// the process is still running when the handle is destroyed, it is killed. The calling process must be single-threaded.
 class TPlugInProcess {
 public:
   using TClock = std::chrono::steady_clock;
 
-  // Starts it. Throws std::system_error, and leaves nothing open, when there is no pipe or no process.
+  // Starts the process. If a pipe or process cannot be created, throws std::system_error and leaks nothing.
   TPlugInProcess(std::string const& name, std::string const& file, TApartLimits const& limits, std::string sampleLabel);
   ~TPlugInProcess();
   TPlugInProcess(TPlugInProcess const&) = delete;
   TPlugInProcess& operator=(TPlugInProcess const&) = delete;
 
-  void AddTo(std::vector<pollfd>& polled) const;  // the descriptors to wait for
-  TClock::time_point NextDeadline() const;        // by which Follow must be called at the latest
+  void AddTo(std::vector<pollfd>& polled) const;  // adds the descriptors to wait for
+  TClock::time_point NextDeadline() const;        // the latest time at which Follow must be called
 
-  // Reads what has arrived, and ends the process at a time limit. Does not block.
+  // Reads the available data, and kills the process if a time limit has expired. Does not block.
   void Follow();
 
-  bool HasEnded() const { return fHasEnded; }  // then the result is complete
+  bool HasEnded() const { return fHasEnded; }  // if true, the result is complete
   TPlugIn const& Result() const { return fResult; }
-  std::string const& Log() const { return fLog; }  // as its log file has it
+  std::string const& Log() const { return fLog; }  // in the format of a log file
 
   std::string const& Name() const { return fResult.fName; }
   std::string Stage() const { return fProvider ? NameOf(EStage::kFill) : NameOf(fStage); }
@@ -57,7 +57,7 @@ private:
   void TakeNamespace(std::string const& milliseconds);
   void TakeFailure(std::string why);
   void Begin(EStage stage);
-  void End(EEnding ending);  // the first reason counts
+  void End(EEnding ending);  // only the first call sets the reason
   void CheckDeadlines();
   void Complete();
   void RecordUnfilled();
@@ -69,22 +69,22 @@ private:
   std::string const fSampleLabel;
   TPlugIn fResult;
   pid_t fSupervisor = -1;
-  TUniqueFd fControl, fAnswer, fWordsEnd, fLogEnd, fVerdictEnd;  // below 0 when closed
+  TUniqueFd fControl, fAnswer, fWordsEnd, fLogEnd, fVerdictEnd;  // empty when closed
 
   TMessageReader fMessages;
-  std::string fBytes;  // of the namespace that is being filled
+  std::string fBytes;  // the serialised namespace received so far
   TWords fWords;
   std::string fLog;
 
   EStage fStage = EStage::kOpen;
-  std::optional<std::string> fProvider;  // that is filling its namespace
+  std::optional<std::string> fProvider;  // the provider that is filling its namespace
   TClock::time_point fStageBegan = TClock::now();
-  std::optional<TClock::time_point> fDeadline;  // of the load or the fill
-  std::optional<TClock::time_point> fGiveUpAt;  // when the supervisor or the process is waited for no longer
+  std::optional<TClock::time_point> fDeadline;  // for loading or filling
+  std::optional<TClock::time_point> fGiveUpAt;  // when to stop waiting for the supervisor or the process
   bool fHasLoaded = false, fHasEnded = false;
   EEnding fEnding = EEnding::kNone;
-  std::string fWhyBad;                     // of kBadAnswer
-  std::optional<std::string> fExitStatus;  // that the plug-in passed to exit
+  std::string fWhyBad;                     // the reason for kBadAnswer
+  std::optional<std::string> fExitStatus;  // passed to exit by the plug-in
   std::optional<std::string> fFatal;       // an exception that ended the process
   std::optional<TVerdict> fVerdict;
 };

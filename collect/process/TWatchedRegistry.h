@@ -9,13 +9,13 @@
 
 namespace NQRVZEP20 {
 
-// The registry of providers in the process of a plug-in. It adds to the registry of the library, and reports what is registered.
+// The provider registry of a plug-in process. It extends the registry of the library, and reports each registration.
 class TWatchedRegistry : public TNamespaceProviderManager {
 public:
   struct TEvents {
-    std::function<void()> fBegins;                          // a registration
-    std::function<void(std::string const& name)> fEnds;     // the provider is registered
-    std::function<void(std::string const& name)> fIsTaken;  // it is not, because another one has its name
+    std::function<void()> fBegins;                          // a registration begins
+    std::function<void(std::string const& name)> fEnds;     // the provider has been registered
+    std::function<void(std::string const& name)> fIsTaken;  // it has not, because its name is taken
   };
 
   TWatchedRegistry(boost::shared_ptr<TNamespaceProviderManager> registry, TEvents events);
@@ -24,7 +24,7 @@ public:
   boost::shared_ptr<INamespaceProvider> GetNamespaceProvider(std::string const& name) const override;
   void EnumerateNamespaceProviders(boost::function<bool(boost::shared_ptr<INamespaceProvider>)> callback) override;
 
-  // The providers that were registered here, in the order of their names.
+  // The providers that were registered through this object, in the order of their names.
   std::vector<boost::shared_ptr<INamespaceProvider>> NewProviders() const;
 
 private:

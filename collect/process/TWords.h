@@ -8,14 +8,14 @@
 
 namespace NQRVZEP20 {
 
-// The first and the last bytes of a text of any length.
+// Keeps the first and the last bytes of a text of any length.
 class TWords {
 public:
-  explicit TWords(std::size_t most) : fMost(most) {}  // kept of either end
+  explicit TWords(std::size_t most) : fMost(most) {}  // the number of bytes to keep at each end
 
   void Add(std::string_view text);
 
-  // The text; where bytes are left out, a line that states their number.
+  // The text; omitted bytes are replaced by a line that states their number.
   std::string Get() const;
 
 private:

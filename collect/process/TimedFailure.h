@@ -9,17 +9,17 @@
 
 namespace NQRVZEP20 {
 
-// Why a piece of work failed: both texts are empty when it succeeded, and the reason also when the failure carries none.
+// Why a piece of work failed. Both strings are empty if it succeeded; the reason is also empty if the exception has none.
 struct TTimedFailure {
   std::string fMessage, fReason;
   double fMilliseconds = 0;
 
-  // For the loading of a library: the reason is that of the dynamic linker.
+  // For loading a library, where the reason is the dynamic linker's message.
   std::string ReasonOrMessage() const { return fReason.empty() ? fMessage : fReason; }
   std::string MessageAndReason() const { return fReason.empty() ? fMessage : fMessage + " (" + fReason + ")"; }
 };
 
-// Runs the work as FailureOf does, and measures how long it takes.
+// Runs the work as FailureOf does, and measures the time that it takes.
 template <class TWork>
 TTimedFailure TimedFailureOf(TWork work) {
   auto const start = std::chrono::steady_clock::now();

@@ -13,7 +13,7 @@ namespace NQRVZEP20 {
 
 // The operating system and this collector as records of CIM classes.
 
-// The machine's name on the network, or the value of the environment variable ZEP_HOST_NAME, so that the table of another machine
+// The machine's host name, or the value of the environment variable ZEP_HOST_NAME, so that the table of another machine
 // (ZEP_SMBIOS_TABLE) can be reported under that machine's name.
 TSystemName SystemNameOf(utsname const& kernel);
 

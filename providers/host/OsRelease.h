@@ -9,8 +9,8 @@
 
 namespace NQRVZEP20 {
 
-// The assignments of an os-release file: NAME=value, one per line, the value bare or in quotes, as a shell reads it. Comments and
-// other lines are ignored; the last assignment of a name counts.
+// The assignments in an os-release file: NAME=value, one per line, with the value unquoted or quoted as in a shell. Comments
+// and other lines are ignored; if a name is assigned more than once, the last value is used.
 std::map<std::string, std::string> ParseOsRelease(std::string_view text);
 
 // The os-release file of an operating system.
@@ -22,7 +22,7 @@ public:
   // `file`: the path of the file; empty when there is none.
   TOsRelease(std::string file, std::string_view text) : fFile(std::move(file)), fValues(ParseOsRelease(text)) {}
 
-  // The value of the first of the names that has one.
+  // The value of the first name that has one.
   TFinding<std::string> Value(std::initializer_list<char const*> names) const;
 
   std::string const& GetFile() const { return fFile; }

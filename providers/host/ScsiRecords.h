@@ -9,12 +9,12 @@
 
 namespace NQRVZEP20 {
 
-// The SCSI devices of this machine, to which USB and SATA disks belong, as the kernel shows them.
+// The SCSI devices of this machine, including USB and SATA disks, as the kernel lists them.
 
-// The directory in which the kernel shows them, or for tests the one that the environment variable ZEP_SCSI_DEVICES names.
+// The directory in which the kernel lists them, or for tests the one named by the environment variable ZEP_SCSI_DEVICES.
 std::string ScsiDirectory();
 
-// One record of each device, in the order of their addresses. A device that is removed meanwhile is omitted.
+// One record per device, in the order of their addresses. A device that is removed during the call is omitted.
 std::vector<TRecord> ScsiRecords(std::string const& directory, TSystemName const& name);
 
 // A record without values, which declares the class, and the reason why there are no devices.

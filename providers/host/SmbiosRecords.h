@@ -13,8 +13,8 @@ namespace NQRVZEP20 {
 // SMBIOS structures as records of CIM classes, with the property names, types and numbers of the DMTF. `source`: the source of
 // the values. `number` counts the instances of the class, from 0.
 
-// The version determines the byte order of the UUID. With an empty version it is the order since version 2.6; when the version is
-// missing because it could not be read, so is the UUID.
+// The version determines the byte order of the UUID. If it is empty, the byte order is that of version 2.6 and later; if it is
+// missing because it could not be read, the UUID is missing, too.
 TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name,
                              TFinding<std::optional<TSmbiosVersion>> const& version = std::optional<TSmbiosVersion>());
 TRecord BiosRecord(TSmbiosStructure const& bios, std::string const& source, unsigned number);
@@ -22,7 +22,7 @@ TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source
 TRecord ProcessorRecord(TSmbiosStructure const& processor, std::string const& source, unsigned number, TSystemName const& name);
 TRecord MemoryRecord(TSmbiosStructure const& memoryDevice, std::string const& source, unsigned number);
 
-// False for a socket or slot that the firmware reports as empty. One without that field counts as filled.
+// False for a socket or slot that the firmware reports as empty. A structure without that field is treated as filled.
 bool IsSocketFilled(TSmbiosStructure const& processor);
 bool IsSlotFilled(TSmbiosStructure const& memoryDevice);
 

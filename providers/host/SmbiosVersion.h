@@ -10,11 +10,11 @@
 
 namespace NQRVZEP20 {
 
-// The version of the SMBIOS standard that tables follow: major and minor, 2.8 as {2, 8}.
+// The version of the SMBIOS standard that the tables conform to, as major and minor: 2.8 is {2, 8}.
 using TSmbiosVersion = std::pair<unsigned, unsigned>;
 
-// The version in an entry point of any of its three forms: "_SM3_", "_SM_", and "_DMI_" of before SMBIOS 2.1. Bytes after it are
-// ignored. None when the bytes do not begin with an entry point, or its length or checksum is wrong.
+// The version in an entry point of any of the three forms: "_SM3_", "_SM_", and "_DMI_" from before SMBIOS 2.1. Bytes after the
+// entry point are ignored. None if the bytes do not begin with an entry point, or its length or checksum is wrong.
 std::optional<TSmbiosVersion> VersionInEntryPoint(std::string_view bytes);
 
 // The version of the tables in a file, from the entry point with which a dump begins; for a bare table, from the file

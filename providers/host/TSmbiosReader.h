@@ -13,7 +13,8 @@ namespace NQRVZEP20 {
 class TSmbiosTables;
 
 // The SMBIOS tables as libsmbios.so reads them: this machine's, or those of the file that the environment variable
-// ZEP_SMBIOS_TABLE names. When the library or the tables cannot be read, every structure is missing, with the reason.
+// ZEP_SMBIOS_TABLE names. If the library cannot be loaded or the tables cannot be read, every structure is missing, with the
+// reason.
 class TSmbiosReader {
 public:
   TSmbiosReader();
@@ -24,10 +25,10 @@ public:
   // The first structure of that type, or a missing structure, whose fields are missing with the reason.
   TSmbiosStructure First(int type) const;
 
-  // Every structure of that type, in the order of the table. With a library that lacks smBiosGetNext: the first only.
+  // All structures of that type, in table order; only the first if the library lacks smBiosGetNext.
   std::vector<TSmbiosStructure> All(int type) const;
 
-  // The version of the SMBIOS standard that the tables follow, as VersionOfTables returns it.
+  // The version of the SMBIOS standard that the tables conform to, as returned by VersionOfTables.
   TFinding<std::optional<TSmbiosVersion>> Version() const;
 
   // The source of the values of a structure of that type: "SMBIOS type 17", or "SMBIOS type 17 (file)".

@@ -17,8 +17,8 @@ constexpr int kSmbiosChassis = 3;
 constexpr int kSmbiosProcessor = 4;
 constexpr int kSmbiosMemoryDevice = 17;
 
-// One SMBIOS structure: a header of four bytes, the formatted area, and the string set. Nothing outside the bytes is read,
-// whatever they contain. Numbers are little-endian; offsets count from the header, as in the SMBIOS standard.
+// One SMBIOS structure: a header of four bytes, the formatted area, and the string set. Never reads out of bounds, even if the
+// structure is malformed. Numbers are little-endian; offsets are from the start of the header, as in the SMBIOS standard.
 class TSmbiosStructure {
 public:
   explicit TSmbiosStructure(std::vector<unsigned char> bytes);
@@ -33,8 +33,8 @@ public:
   TFinding<std::uint32_t> DWord(std::size_t offset) const;
   TFinding<std::vector<unsigned char>> Bytes(std::size_t offset, std::size_t count) const;
 
-  // The string to which the field at that offset refers, verbatim. Missing when the field is 0, when the string set has fewer
-  // strings, or when the string has no end.
+  // The string to which the field at that offset refers, verbatim. Missing if the field is 0, the string set has fewer strings,
+  // or the string is not terminated.
   TFinding<std::string> Text(std::size_t offset) const;
 
 private:

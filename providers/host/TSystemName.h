@@ -8,7 +8,7 @@
 
 namespace NQRVZEP20 {
 
-// The machine's name on the network, and its source.
+// The machine's host name, and its source.
 struct TSystemName {
   TSystemName(std::string name, std::string source) : fName(std::move(name)), fSource(std::move(source)) {}
   TSystemName(TFinding<std::string> name, std::string source) : fName(std::move(name)), fSource(std::move(source)) {}

@@ -7,10 +7,10 @@
 
 namespace NQRVZEP20 {
 
-// CIM names: their characters and their comparison. The case of A to Z does not matter; other bytes are compared unchanged.
+// The syntax and comparison of CIM names. Comparison ignores the case of ASCII letters; other bytes are compared unchanged.
 
-// A letter or an underscore, then letters, digits and underscores. Every byte from 0x80 up counts as a letter, so that a name may
-// contain UTF-8.
+// A name is a letter or an underscore, followed by letters, digits and underscores. All bytes from 0x80 up are treated as
+// letters, so that a name may contain UTF-8.
 bool IsCIMName(std::string const& text);
 
 // Throws kZEPStatusInvalidCIMName unless the text is a CIM name.
@@ -18,7 +18,7 @@ void RequireCIMName(std::string const& text);
 
 bool IsSameName(std::string_view a, std::string_view b);
 
-// The name in lower case: the same text for every spelling.
+// The name in lower case, which is the same string for every spelling.
 std::string FoldName(std::string name);
 
 // For unordered containers keyed by name.

@@ -75,8 +75,8 @@ public:
 
   void AddSubClass(boost::shared_ptr<TMemoryClass> subClass) { fSubClasses.push_back(subClass); }
 
-  // Releases everything except the name. A value owns the class that it refers to, so classes can own one another in circles,
-  // which the namespace breaks when it is destroyed.
+  // Releases everything except the name. A value owns the class that it refers to, so ownership cycles between classes are
+  // possible, which the namespace breaks when it is destroyed.
   void Empty();
 
 private:

@@ -25,7 +25,7 @@ class TMemoryClass;
 //       .Property("State", "uint16").ValueMap({"0", "1"}, {"Unknown", "Ready"})
 //       .Method("Reset", "uint32").In("Force", "boolean").Out("Log", "string[]");
 //
-// A refusal is logged as an error and throws a TZEPFailure whose reason names what was refused. Earlier descriptions stay.
+// A refusal is logged as an error and throws a TZEPFailure whose reason names the refused element. Earlier descriptions remain.
 class TMemoryClassBuilder {
 public:
   explicit TMemoryClassBuilder(boost::shared_ptr<TMemoryClass> cls);
@@ -63,7 +63,7 @@ public:
   TMemoryClassBuilder& Description(std::string const& text);
   TMemoryClassBuilder& Override();  // for a property that a superclass declares, too
 
-  // The values of an enumeration, and a word for each.
+  // The values of an enumeration, and a name for each.
   TMemoryClassBuilder& ValueMap(std::vector<std::string> const& values, std::vector<std::string> const& words);
 
   // Any qualifier that the namespace declares, with its declared flavor. An integer may be given in any integer type.

@@ -23,10 +23,10 @@ class TMemoryQualifierDecl;
 //   ns->DefineClass("X_Disk", "X_Device").Property("Name", "string").Property("Sizes", "uint64[4]");
 //   ns->AddInstance("X_Disk", {{"Id", 5}, {"Name", "sda"}});
 //
-// Always held by boost::shared_ptr. The namespace owns its contents and releases them when it is destroyed. A class that outlives
-// it is empty, and an instance keeps its values except references; an operation that needs the namespace, or a class that was
-// destroyed, throws boost::bad_weak_ptr. Lookups by name and by object path take constant time. Contexts are ignored. Several
-// threads may read at the same time while none writes.
+// Always held by boost::shared_ptr. The namespace owns its contents and releases them when it is destroyed. A class that
+// outlives it is empty, and an instance keeps its values except references; an operation that needs the namespace, or a class
+// that was destroyed, throws boost::bad_weak_ptr. Lookups by name and by object path take constant time. Contexts are ignored.
+// Several threads may read concurrently while none writes.
 class TMemoryNamespace : public ICIMNamespace, public boost::enable_shared_from_this<TMemoryNamespace> {
 public:
   // Empty: without classes and without qualifier declarations.
@@ -48,8 +48,8 @@ public:
 
   // A path names an instance by its own class and exactly its keys (those that are not NULL): a path with the name of the
   // superclass finds only instances of the superclass itself. Case does not matter in class and key names. Key values are
-  // compared by their text, which has every digit of a real. An instance without any key value has no path of its own and is
-  // never found; a class may have several such instances.
+  // compared by their text, which has all significant digits of a real. An instance without any key value has no path of its
+  // own and is never found; a class may have several such instances.
   boost::shared_ptr<ICIMInstance> GetInstance(TCIMReference const& path, TCIMContext const& context) const override;
 
   // ---- Filling. A refusal is logged as an error and throws a TZEPFailure whose reason names what was refused. ----

@@ -12,8 +12,8 @@ namespace NQRVZEP20 {
 
 class TMemoryNamespace;
 
-// A provider of one namespace in memory, which a function fills at the first call of GetNamespace. A plug-in creates and
-// registers the provider in its start-up code, where collecting the data would be too early:
+// A provider of one in-memory namespace, which a function fills on the first call of GetNamespace. A plug-in creates and
+// registers the provider during static initialisation, when it is too early to collect the data:
 //
 //   boost::make_shared<TMemoryProvider>("Clock", "root/clock", FillNamespace)
 class TMemoryProvider : public INamespaceProvider {
@@ -25,7 +25,8 @@ public:
 
   std::string const& GetName(TCIMContext const& context) const override;
 
-  // An exception of the function passes on, and the incomplete namespace is dropped: the next call fills a new one.
+  // If the function throws, the exception passes through and the incomplete namespace is discarded; the next call fills a new
+  // one.
   boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) override;
 
 private:

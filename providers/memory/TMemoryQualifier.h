@@ -21,7 +21,7 @@ public:
 
   std::string const& Name() const { return fDeclaration->Name(); }
 
-  // False for the boolean value false: a qualifier whose value is false counts as absent.
+  // False for the boolean value false: a qualifier whose value is false is treated as absent.
   bool IsSet() const;
 
 private:

@@ -7,9 +7,9 @@
 
 namespace NQRVZEP20 {
 
-// The type of a property or parameter, as in a schema: "uint32", "string[]" for an array, "uint8[16]" for an array of at most 16
-// elements; or from the library's own type tag. Any other text or tag becomes the tag kCIMTypeInvalid, which every declaration
-// refuses with kZEPStatusTypeMismatch.
+// The type of a property or parameter, as in a schema: "uint32", "string[]" for an array, "uint8[16]" for an array of at most
+// 16 elements; or from the library's own type tag. Any other string or tag becomes the tag kCIMTypeInvalid, which every
+// declaration refuses with kZEPStatusTypeMismatch.
 class TMemoryType {
 public:
   TMemoryType(char const* text);

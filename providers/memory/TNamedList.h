@@ -14,7 +14,7 @@
 namespace NQRVZEP20 {
 
 // Calls back with each element, in order, until a call returns false; returns false when one did. An element that is removed
-// meanwhile is not visited, and one that is added is.
+// during the call is not visited; one that is added is visited.
 template <class TElement, class TCallback>
 bool VisitEach(std::vector<boost::shared_ptr<TElement>> const& elements, TCallback const& callback) {
   for (std::size_t i = 0; i < elements.size(); ++i) {
@@ -26,7 +26,7 @@ bool VisitEach(std::vector<boost::shared_ptr<TElement>> const& elements, TCallba
 }
 
 // Elements in the order in which they were added, found by name in constant time. Name() of an element is its name. Most lists
-// are short, and there are very many of them: a list of few elements has no index, and no list copies the names.
+// are short, and there are very many of them, so a list with few elements has no index, and no list copies the names.
 template <class TElement>
 class TNamedList {
 public:

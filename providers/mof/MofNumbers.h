@@ -12,7 +12,7 @@ namespace NQRVZEP20 {
 // `span` when the text is not a number, the number does not fit the type, or the type is neither a number nor char16.
 TCIMValue ReadMofNumber(std::string_view text, TCIMValue::TCIMType type, TMofSpan const& span);
 
-// The shortest text that is read back as the same number. Throws kZEPStatusNotSupported when the number is not finite.
+// The shortest text that parses to the same number. Throws kZEPStatusNotSupported when the number is not finite.
 std::string MofRealText(float number);
 std::string MofRealText(double number);
 

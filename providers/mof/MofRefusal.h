@@ -7,8 +7,8 @@
 
 namespace NQRVZEP20 {
 
-// Runs one step on a namespace. An exception of the namespace becomes a TMofError at `span`: the name there and `words` for the
-// status `expected`, the name of the status otherwise.
+// Runs one step on a namespace. An exception of the namespace becomes a TMofError at `span`. Its message is the name at `span`
+// followed by `words` if the status is `expected`, and otherwise the name of the status.
 template <class TStep>
 auto StepAt(TMofSpan const& span, EZEPStatusCode expected, char const* words, TStep const& step) {
   try {

@@ -16,7 +16,7 @@ void AppendUnescaped(std::string& text, TMofSpan const& literal);
 // The code of a character literal, given with its quotes: 'a', '\x0041'. Throws TMofError unless it is one character of 16 bits.
 unsigned short CharacterOf(TMofSpan const& literal);
 
-// The text for between double quotes, on one line.
+// The text escaped for use between double quotes, on one line.
 std::string Escaped(std::string_view text);
 std::string EscapedCharacter(unsigned short code);  // 'a' with its quotes
 

@@ -12,7 +12,7 @@
 
 namespace NQRVZEP20 {
 
-// The syntax tree of MOF, which the parser makes and the builder declares. Names are views of the files, which the document
+// The syntax tree of MOF, which the parser creates and the builder declares. Names are views into the files, which the document
 // owns. The trees of classes and instances are not kept, because there may be very many: the document stores their positions,
 // and each is parsed again when it is declared.
 
@@ -69,7 +69,7 @@ struct TMofFeature : TMofParameter {
 struct TMofClass {
   TMofQualifiers fQualifiers;
   TMofSpan fName;
-  TMofSpan fSuperClass;  // with an empty text when there is none
+  TMofSpan fSuperClass;  // its fText is empty if there is none
   std::vector<TMofFeature> fFeatures;
 };
 
@@ -80,7 +80,7 @@ struct TMofAssignment {
 
 struct TMofInstance {
   TMofSpan fClassName;
-  TMofSpan fAlias;  // with an empty text when there is none
+  TMofSpan fAlias;  // its fText is empty if there is none
   std::vector<TMofAssignment> fValues;
 };
 

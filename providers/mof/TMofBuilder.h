@@ -15,7 +15,7 @@ class ICIMNamedElement;
 class ICIMQualifierDecl;
 
 // Declares the contents of a document in a namespace. All classes are created before the first property is declared, so that a
-// reference may name a later class. Throws TMofError for a declaration that is wrong, or that the namespace refuses.
+// reference may name a later class. Throws TMofError for a declaration that is invalid or that the namespace refuses.
 class TMofBuilder {
 public:
   TMofBuilder(TMofDocument const& document, boost::shared_ptr<ICIMNamespace> ns) : fDocument(document), fNamespace(ns) {}

@@ -9,7 +9,7 @@
 
 namespace NQRVZEP20 {
 
-// A text, and its name in errors.
+// A source text, and its name in error messages.
 struct TMofFile {
   std::string fName;
   std::string fText;
@@ -24,8 +24,8 @@ struct TMofSpan {
 inline std::string TextAt(TMofSpan const& span) { return std::string(span.fText); }
 
 // An error in a MOF text, with its position: "disks.mof:3:14: expected ";", found "class"". Lines and columns count from 1,
-// columns in bytes. The status is kZEPStatusInvalidFormat, that of a file that cannot be read, or that with which the namespace
-// refused a declaration.
+// columns in bytes. The status is kZEPStatusInvalidFormat, the status for a file that cannot be read, or the status with which
+// the namespace refused a declaration.
 class TMofError : public TZEPException {
 public:
   TMofError(TMofSpan const& span, std::string const& reason, EZEPStatusCode status = kZEPStatusInvalidFormat);

@@ -14,7 +14,7 @@ class ICIMInstance;
 class ICIMProperty;
 
 // Creates the instances of a document. An alias may be used before and after its instance, and instances may refer to one
-// another in circles, as long as the keys of no instance depend on themselves.
+// another cyclically, as long as no instance's keys depend on themselves.
 class TMofInstances {
 public:
   TMofInstances(TMofDocument const& document, boost::shared_ptr<ICIMNamespace> ns) : fDocument(document), fNamespace(ns) {}

@@ -23,7 +23,7 @@ struct TMofToken {
   std::string_view fText;  // of the file
 };
 
-// Splits a text into tokens and drops blanks and comments. Throws TMofError for text that is not a token.
+// Splits a text into tokens and skips white space and comments. Throws TMofError for text that is not a token.
 class TMofLexer {
 public:
   explicit TMofLexer(TMofFile const& file) : TMofLexer(file, file.fText.data()) {}

@@ -10,7 +10,7 @@
 
 namespace NQRVZEP20 {
 
-// Reads the syntax of MOF; the builder checks the meaning. Throws TMofError, whose message names the expected text.
+// Parses the syntax of MOF; the builder checks the semantics. Throws TMofError, whose message names the expected token.
 class TMofParser {
 public:
   explicit TMofParser(TMofFile const& file) : TMofParser(file, file.fText.data()) {}

@@ -8,7 +8,7 @@ namespace NQRVZEP20 {
 // Why a value is missing.
 struct TMissing {
   std::string fCode;    // for programs: one of the codes below, or a provider's own
-  std::string fReason;  // for people: a clause without a capital and without a full stop
+  std::string fReason;  // human-readable: a clause that begins in lower case and has no full stop
 };
 
 // Codes of providers.
@@ -16,8 +16,8 @@ constexpr char const* kMissingNoTables = "no-smbios";          // the system exp
 constexpr char const* kMissingNeedsRoot = "needs-root";        // only root may read the source
 constexpr char const* kMissingUnreadable = "unreadable";       // the source cannot be read for another reason
 constexpr char const* kMissingPlaceholder = "placeholder";     // the source contains a placeholder text instead of a value
-constexpr char const* kMissingNotGiven = "not-given";          // the source omits the value or calls it unknown
-constexpr char const* kMissingUnexpected = "unexpected-form";  // the source contains something that is not such a value
+constexpr char const* kMissingNotGiven = "not-given";          // the source omits the value or reports it as unknown
+constexpr char const* kMissingUnexpected = "unexpected-form";  // the source contains something that is not a valid value
 
 // Codes of front ends.
 constexpr char const* kMissingNotDescribed = "not-described";      // no provider has the class, or an instance of it

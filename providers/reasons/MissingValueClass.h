@@ -3,9 +3,9 @@
 
 namespace NQRVZEP20 {
 
-// How a namespace states sources and reasons. The writer and the reader share these names.
+// The names under which a namespace records sources and reasons, for the writer and the reader.
 
-// A qualifier of a property: the source of its values, a string.
+// A qualifier of a property, of type string: the source of its values.
 constexpr char const* kValueSource = "ValueSource";
 
 // A class with one instance for each missing value. All properties are strings; the first two are the keys.

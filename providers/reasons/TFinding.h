@@ -12,7 +12,7 @@ namespace NQRVZEP20 {
 template <class T>
 class TFinding;
 
-// The finding that a function's result is or becomes: TFinding<int> for int and for TFinding<int>.
+// The TFinding type for the result type of a function: TFinding<int> for int and for TFinding<int>.
 template <class T>
 struct TFindingOf {
   using TType = TFinding<T>;
@@ -24,7 +24,7 @@ struct TFindingOf<TFinding<T>> {
 
 // A value, or the reason why it is missing.
 //
-// A plain value: a copy copies what it holds. A function that may fail returns its result or a TMissing:
+// A plain value; copies are as deep as those of its value. A function that may fail returns its result or a TMissing:
 //
 //   TFinding<int> PortFrom(std::string const& text) {
 //     if (!IsNumber(text)) return TMissing{kMissingUnexpected, "\"" + text + "\" is not a number"};
@@ -48,8 +48,8 @@ public:
   // Throws std::bad_variant_access when there is a value.
   TMissing const& Why() const { return std::get<TMissing>(fContent); }
 
-  // Passes the value on to `next` and returns its result, which may be missing in turn: `next` returns a value or a finding.
-  // A missing value stays missing, for the same reason, and `next` is not called.
+  // Passes the value to `next` and returns the result of `next`, which is a value or a finding. If the value is missing, the
+  // result is missing for the same reason, and `next` is not called.
   //
   //   ReadLine(file).Then(PortFrom)
   //   PortFrom(text).Then([](int port) { return port + 1; })

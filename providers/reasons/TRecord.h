@@ -11,7 +11,7 @@
 
 namespace NQRVZEP20 {
 
-// One property of an instance: its value, or the reason why that is missing, and the source.
+// One property of an instance: its value or the reason why it is missing, and the source.
 struct TRecordProperty {
   std::string fName;
   TCIMValue fValue;  // NULL when it is missing, but always of the property's type
@@ -20,24 +20,24 @@ struct TRecordProperty {
   TMissing fMissing;    // only when the value is NULL
 };
 
-// An instance before it is written to a namespace (TRecordWriter): its properties in the order in which they were added, each
-// with a value or a reason.
+// An instance to be written to a namespace by TRecordWriter: its properties in the order in which they were added, each with a
+// value or a reason.
 //
 //   TRecord record("X_Disk", "sysfs");
 //   record.AddKey("Name", "sda");
 //   record.Add("Model", ReadLine("/sys/block/sda/device/model"));
 //
-// The records of one class must have the same properties in the same order: each of them can serve to declare the class.
-// A plain value: a copy is deep.
+// The records of one class must have the same properties in the same order, because the class can be declared from any of them.
+// A plain value: copies are deep.
 class TRecord {
 public:
-  // `source`: where the values come from, a short text for people, such as "sysfs" or "SMBIOS type 17".
+  // `source`: where the values come from, in human-readable form, such as "sysfs" or "SMBIOS type 17".
   TRecord(std::string className, std::string source) : fClassName(std::move(className)), fSource(std::move(source)) {}
 
   // Sets the source of the properties that are added afterwards.
   void SetSource(std::string source) { fSource = std::move(source); }
 
-  // A key property whose value the provider itself chooses; it has no source.
+  // A key property whose value the provider itself chooses, so that it has no source.
   void AddKey(std::string name, TCIMValue value) { fProperties.push_back({std::move(name), std::move(value), true, "", {}}); }
 
   // A key property whose value comes from the source.
@@ -48,14 +48,14 @@ public:
   }
 
   // A key property that repeats a key of another instance, such as the name of the system that a disk belongs to. It has no
-  // source: that of the other instance applies.
+  // source of its own: the source of the other instance applies.
   template <class T>
   void AddPropagatedKey(std::string name, TFinding<T> const& finding) {
     AddKey(std::move(name), finding);
     fProperties.back().fSource.clear();
   }
 
-  // Any other property. Its type is the CIM type of T, also when the value is missing.
+  // Any other property. Its type is the CIM type of T, even if the value is missing.
   template <class T>
   void Add(std::string name, TFinding<T> const& finding) {
     if (finding)

@@ -10,14 +10,14 @@ namespace NQRVZEP20 {
 
 class TMemoryNamespace;
 
-// Writes records into a namespace, with the sources of their values and the reasons for missing ones.
+// Writes records into a namespace, with the sources of their values and the reasons for missing values.
 //
 //   TRecordWriter writer(ns);
 //   writer.Write(SystemRecord());
 //   writer.Write(DiskRecord(""), diskRecords, TMissing{kMissingNotGiven, "this machine has no disks"});
 //   writer.WriteMissing();
 //
-// Each class is declared flat, without superclass. The source of a property becomes its qualifier ValueSource, and each missing
+// Each class is declared without a superclass. The source of a property becomes its qualifier ValueSource, and each missing
 // value becomes an instance of the class ZEP_MissingValue (MissingValueClass.h). TReasonReader reads both.
 //
 // The writer keeps a reference to the namespace. Every operation throws what the namespace throws (TMemoryNamespace.h), such as
@@ -30,11 +30,11 @@ public:
   // Declares the class of the record and adds this one instance.
   void Write(TRecord const& record);
 
-  // Declares the class of `shape`, whose values are ignored, and adds an instance for each record. Without any record,
-  // `whyNone` becomes the reason why the class has no instance.
+  // Declares the class from `shape`, whose values are ignored, and adds an instance for each record. If there are no records,
+  // `whyNone` is recorded as the reason why the class has no instance.
   void Write(TRecord const& shape, std::vector<TRecord> const& records, TMissing const& whyNone);
 
-  // States why a property of an instance is missing that was added to the namespace directly. `path` is its object path
+  // Records why a property is missing in an instance that was added to the namespace directly. `path` is its object path
   // without the namespace, as ICIMInstance::GetPath(...).GetPath() returns it.
   void AddMissing(std::string const& path, std::string const& property, TMissing const& why);
 

@@ -10,19 +10,19 @@ class App;
 
 namespace NQRVZEP20::zep {
 
-// Runs a command whose arguments are parsed; returns an EExitStatus.
+// Runs a command after its arguments have been parsed; returns an EExitStatus.
 using TRun = std::function<int()>;
 
-// A subcommand. `fAddArguments` adds its arguments to `command` and returns the function that runs it. Each has a file of its
-// own; main.cpp has the table.
+// A subcommand. `fAddArguments` adds its arguments to `command` and returns the function that runs it. Each subcommand has a
+// source file of its own; main.cpp has the table.
 struct TCommand {
   char const* fName;
   char const* fDescription;
   TRun (*fAddArguments)(CLI::App& command);
 };
 
-// Separates, among the remaining words of CLI11, the command line that "zep run" runs: everything after it, whatever it looks
-// like.
+// Marks, among the remaining arguments of CLI11, the command line that "zep run" runs: it consists of all arguments after this
+// one, even if they look like options.
 constexpr char const* kCommandFollows = "command:";
 
 // The default command of "zep media"; its document is that of "zep media".
@@ -42,7 +42,7 @@ TRun AddSendArguments(CLI::App& command);        // SendCommand.cpp
 TRun AddShowArguments(CLI::App& command);        // ShowCommand.cpp
 TRun AddWpadArguments(CLI::App& command);        // WpadCommand.cpp
 
-// The subcommand of that name, or null; it belongs to `app` (HelpCommand.cpp).
+// The subcommand of that name, which `app` owns, or null (HelpCommand.cpp).
 CLI::App const* CommandNamed(CLI::App const& app, std::string const& name);
 
 }  // namespace NQRVZEP20::zep

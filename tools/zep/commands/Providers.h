@@ -15,11 +15,11 @@ class App;
 
 namespace NQRVZEP20::zep {
 
-// The bundled sample: the SMBIOS table of an invented server, labelled SAMPLE. Throws std::runtime_error when it is not
+// The bundled sample: the SMBIOS table of an invented server, labelled SAMPLE. Throws std::runtime_error if it is not
 // installed.
 TSample BundledSample();
 
-// The bundled sample for a command that was called with --sample; otherwise none.
+// The bundled sample if the command was called with --sample (`isWanted`); otherwise none.
 std::optional<TSample> SampleIf(bool isWanted);
 
 // How a command loads plug-ins.
@@ -31,8 +31,8 @@ struct TPlugInArguments {
 
 void AddPlugInOptions(CLI::App& command, TPlugInArguments& arguments);
 
-// The plug-ins, each loaded in a process of its own, or in this one. While they work, their progress is shown on the terminal of
-// standard error; afterwards what they printed is written there.
+// Loads the plug-ins, each in a process of its own, or with fInProcess in this one. If standard error is a terminal, progress
+// is shown on it; afterwards the output of the plug-ins is written to standard error. Blocks until all plug-ins have ended.
 std::vector<TPlugIn> LoadPlugInsFor(TPlugInArguments const& arguments, std::optional<TSample> const& sample);
 
 }  // namespace NQRVZEP20::zep

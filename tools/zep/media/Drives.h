@@ -16,7 +16,7 @@ std::uint64_t NumberOf(std::string const& path);
 // Whether the first block device is a partition of the second, according to the kernel.
 bool IsPartitionOf(std::string const& partition, std::string const& device);
 
-// Identifiers of drives, for comparison only. A file system without a drive has an identifier, too.
+// Opaque identifiers of drives, for comparison only. A file system without a drive has an identifier, too.
 using TDrives = std::set<std::string>;
 
 // The drives that contain a mounted file system: directly, in a partition, or in an encrypted or logical volume. A drive can be

@@ -17,7 +17,7 @@ bool IsPlainPath(std::string const& name);
 // "/mnt/key" for "/mnt/key/"; "/" is returned unchanged.
 std::string WithoutTrailingSlashes(std::string name);
 
-// Throws TWrongUsage for a name that is not a plain path below /dev, std::runtime_error for a device that does not exist.
+// Throws TWrongUsage for a name that is not a plain path below /dev, and std::runtime_error for a device that does not exist.
 void CheckDevice(std::string const& device);
 
 // ---- Media and mounts ----
@@ -25,7 +25,7 @@ void CheckDevice(std::string const& device);
 // A removable medium, or a partition of one, that can hold a file system.
 struct TMedium {
   std::string fDevice;       // "/dev/sdb1"
-  std::string fDescription;  // maker and product; may be empty, like the label and the file system
+  std::string fDescription;  // vendor and product; may be empty, like the label and the file system
   std::string fLabel, fFileSystem;
   std::uint64_t fSize;  // in bytes
   bool fIsReadOnly;
@@ -33,18 +33,18 @@ struct TMedium {
   bool fIsOptical;
 };
 
-// Returns the media of the disks and drives that are removable or connected by USB, from the output of "lsblk --json". Throws
-// std::runtime_error when the output has another format.
+// Returns the media in disks and drives that are removable or connected by USB, from the output of "lsblk --json". Throws
+// std::runtime_error if the output has another format.
 std::vector<TMedium> MediaIn(std::string const& lsblkOutput);
 
-// Copies the label and the file system from the output of "blkid -o export" to the medium.
+// Sets the label and the file system of the medium from the output of "blkid -o export".
 void ReadLabel(std::string const& blkidOutput, TMedium& medium);
 
 // The media of this machine.
 std::vector<TMedium> FindMedia();
 
-// Whether this user can see labels and file systems. Root can read them from the devices; where udev runs, it publishes them to
-// every user.
+// Whether this user can see labels and file systems. Root can read them from the devices; if udev is running, every user can
+// get them from it.
 bool AreLabelsReadable();
 
 struct TMount {
@@ -58,7 +58,7 @@ struct TMount {
 std::vector<TMount> MountsIn(std::string const& mountInfo);
 std::vector<TMount> Mounts();
 
-// The mount whose mount point is exactly `directory`; the topmost when there are several.
+// The mount whose mount point is exactly `directory`; if there are several, the topmost.
 std::optional<TMount> MountIn(std::string const& mountInfo, std::string const& directory);
 std::optional<TMount> MountAt(std::string const& directory);
 

@@ -7,19 +7,19 @@
 
 namespace NQRVZEP20::zep {
 
-// A medium that the library has mounted. Every function throws std::runtime_error with the reason, or TWrongUsage for a wrong
-// name.
+// A medium that the library has mounted. On failure, every function throws std::runtime_error with the reason, or TWrongUsage
+// for an invalid name.
 class TMountedMedium {
 public:
-  // Mounts the device at the library's mount point for it, which is created when it is missing. It is not an error when the
-  // device is already mounted there, but it is an error when another device is.
+  // Mounts the device at the library's mount point for it, which is created if it is missing. It is not an error if the device
+  // is already mounted there, but it is an error if another device is.
   explicit TMountedMedium(std::string const& device);
 
-  std::string const& Device() const { return fMount.fSource; }  // the mounted device: the one given, or its first partition
+  std::string const& Device() const { return fMount.fSource; }  // the mounted device: `device` or its first partition
   std::string const& MountPoint() const { return fMountPoint; }
 
-  // Writes a new file into the root directory. On return, the complete file is on the medium. Also throws when a file of that
-  // name exists or an interrupt is pending (Interrupts.h). After an exception, the medium has no new file.
+  // Writes a new file into the root directory and blocks until the complete file is on the medium. Also throws if a file of
+  // that name exists or an interrupt is pending (Interrupts.h). If it throws, it leaves no new file on the medium.
   void Write(std::string const& name, std::string const& contents) const;
 
 private:
@@ -27,9 +27,9 @@ private:
   TMount fMount;
 };
 
-// Unmounts the medium at a directory below /mnt, /media or /run/media; throws TWrongUsage for any other directory. On return, all
-// data are on the medium. Returns the mount points at which the medium or another partition of its drive is still mounted; empty
-// when the medium can be removed.
+// Unmounts the medium at a directory below /mnt, /media or /run/media; throws TWrongUsage for any other directory. Blocks until
+// all data are on the medium. Returns the mount points at which the medium or another partition of its drive is still mounted;
+// if there are none, the medium can be removed.
 std::vector<std::string> UnmountDirectory(std::string const& directory);
 
 // "can be removed", or "is still mounted at /media/a".

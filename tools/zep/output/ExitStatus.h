@@ -9,17 +9,17 @@ namespace NQRVZEP20::zep {
 enum EExitStatus {
   kExitComplete = 0,  // everything was done
   kExitNothing = 1,   // nothing was done
-  kExitPartial = 2,   // a part was done; the output states what is missing, and why
+  kExitPartial = 2,   // part of it was done; the output states what is missing, and why
   kExitUsage = 64,    // wrong usage
 
-  // Only of transfers, which end with kExitNothing when the server refuses them or they fail halfway:
+  // Only for transfers, which end with kExitNothing if the server refuses them or they fail halfway:
   kExitNoInput = 66,       // the file to send cannot be read
   kExitNoConnection = 68,  // the host is unknown or does not answer
   kExitNoLibrary = 69,     // libcurl is missing or unsuitable
   kExitNotWritten = 73,    // the local file exists already, or cannot be written
-  kExitStalled = 75,       // nothing moved for too long
+  kExitStalled = 75,       // no data moved for too long
 
-  // Only in documents: zep dies of the signal that interrupted it, which a shell reports as this number.
+  // Only in documents: zep is killed by the signal that interrupted it, which a shell reports as this number.
   kExitHangUp = 129,
   kExitInterrupt = 130,
   kExitTermination = 143

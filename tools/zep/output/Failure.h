@@ -10,7 +10,8 @@
 
 namespace NQRVZEP20::zep {
 
-// Ends zep with that status. The text states the cause and, where there is one, the remedy; it contains no password.
+// A failure that ends zep with the exit status `fStatus`. The message gives the cause and, if there is one, the remedy; it
+// contains no password.
 struct TFailure : std::runtime_error {
   TFailure(EExitStatus status, std::string const& why) : std::runtime_error(why), fStatus(status) {}
 

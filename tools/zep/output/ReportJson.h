@@ -6,7 +6,7 @@
 
 namespace NQRVZEP20::zep {
 
-// The report as a document, with every instance of every namespace. Its exit status is that of the report's completeness.
+// The report as a document, with every instance of every namespace. Its exit status reflects the completeness of the report.
 TJson ReportAsJson(TReport const& report);
 
 }  // namespace NQRVZEP20::zep

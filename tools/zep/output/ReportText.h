@@ -7,7 +7,7 @@
 
 namespace NQRVZEP20::zep {
 
-// The report for people: the head lines, then tables of the identity, the details and the plug-ins.
+// The report as text: the head lines, then tables of the identity, the details and the plug-ins.
 std::string ReportAsText(TReport const& report);
 
 }  // namespace NQRVZEP20::zep

@@ -11,9 +11,9 @@
 
 namespace NQRVZEP20::zep {
 
-// The plug-ins at work, with stage and seconds, on the terminal of standard error: one line that is written over and over and
-// removed at the end; with TERM=dumb a line for each plug-in and stage. Nothing is written when standard error is not a terminal,
-// nor about a stage that takes less than half a second.
+// Shows the running plug-ins, with their stages and elapsed seconds, on standard error if it is a terminal: in one line that is
+// overwritten repeatedly and removed at the end, or with TERM=dumb in a line per plug-in and stage. Stages that take less than
+// half a second are not shown.
 class TPlugInProgress {
 public:
   TPlugInProgress() : TPlugInProgress(ErrorsLayout()) {}
@@ -21,7 +21,7 @@ public:
 
   void Show(std::vector<TPlugInAtWork> const& atWork) { Write(TextFor(atWork)); }
 
-  // What Show writes next.
+  // The text that Show would write next.
   std::string TextFor(std::vector<TPlugInAtWork> const& atWork);
 
 private:
@@ -29,8 +29,8 @@ private:
   std::string LinesFor(std::vector<TPlugInAtWork> const& slow);
 
   ELayout const fLayout;
-  bool fHasLine = false;                                   // on a terminal
-  std::set<std::pair<std::string, std::string>> fWritten;  // plug-ins and stages, with TERM=dumb
+  bool fHasLine = false;                                   // whether the terminal shows a line
+  std::set<std::pair<std::string, std::string>> fWritten;  // with TERM=dumb: the plug-ins and stages already written
 };
 
 }  // namespace NQRVZEP20::zep

@@ -9,9 +9,9 @@
 
 namespace NQRVZEP20::zep {
 
-// While a guard exists, SIGHUP, SIGINT and SIGTERM do not end zep at once, so that it can remove what it made and report what is
-// left. They interrupt blocking calls, and have their effect at the end of the guard: a guard must therefore outlive the handler
-// that prints the message. Of several signals only the first one counts. A signal that is ignored stays ignored.
+// While a guard exists, SIGHUP, SIGINT and SIGTERM do not end zep immediately, so that it can clean up and report what remains.
+// They interrupt blocking calls, and take effect when the guard is destroyed; the guard must therefore outlive the handler that
+// prints the message. If several signals arrive, only the first one takes effect. An ignored signal stays ignored.
 class TInterruptGuard {
 public:
   TInterruptGuard();
@@ -20,8 +20,8 @@ public:
   TInterruptGuard& operator=(TInterruptGuard const&) = delete;
 };
 
-// While one exists, these signals are blocked for zep and for the programs that it starts, so that a Ctrl-C on the terminal does
-// not end a program in the middle. They arrive at its end.
+// While an object exists, these signals are blocked for zep and for the programs that it starts, so that a Ctrl-C on the
+// terminal does not interrupt a program halfway. They are delivered when the object is destroyed.
 class TInterruptsBlocked {
 public:
   TInterruptsBlocked();
@@ -33,17 +33,18 @@ private:
   sigset_t fBefore;
 };
 
-// The signal that arrived and has not had its effect yet; 0 when there is none.
+// The signal that has arrived but has not taken effect yet; 0 if there is none.
 int PendingInterrupt();
 
-// Called when only the outcome is left to be printed. Returns true when an interrupt is pending, which then ends zep. Otherwise
-// no interrupt has an effect from now on, and zep ends with the status that it prints.
+// Call it when only the outcome remains to be printed. Returns true if an interrupt is pending, which will then end zep.
+// Otherwise signals have no effect from now on, and zep exits with the status that it prints.
 bool IsInterruptedAtLast();
 
-// The exit status that a document gives for the pending interrupt.
+// The exit status for the pending interrupt in a document.
 EExitStatus StatusOfInterrupt();
 
-// Throws TFailure with that status when an interrupt is pending. The text is `what` and ": interrupted", or "interrupted" alone.
+// If an interrupt is pending, throws TFailure with that status and the message "`what`: interrupted", or "interrupted" if
+// `what` is empty.
 void ThrowIfInterrupted(std::string const& what = "");
 
 }  // namespace NQRVZEP20::zep

@@ -11,18 +11,18 @@
 
 namespace NQRVZEP20::zep {
 
-// Sends a text from the child to its owner at once. Throws std::system_error when the owner no longer reads.
+// Sends text from the child to its owner, unbuffered. Throws std::system_error if the owner no longer reads.
 using TSend = std::function<void(std::string_view text)>;
 
-// A child process that does one piece of work and sends text to its owner. A child that still runs when its owner is destroyed
-// is killed. Movable; an object that was moved from owns no child. The caller has a single thread.
+// A child process that does one piece of work and sends text to its owner. If the child is still running when the object is
+// destroyed, it is killed. Movable; a moved-from object owns no child. The calling process must be single-threaded.
 class TChildProcess {
 public:
-  // `signalOfOrphan`: the signal that the child gets when this process dies first. The child ends without this process's
-  // clean-up. Throws std::system_error, and leaves nothing open, when there is no pipe or no process.
+  // `signalOfOrphan`: the signal that is sent to the child if this process dies first. The child exits without running this
+  // process's clean-up. If the pipe or process cannot be created, throws std::system_error and leaks nothing.
   TChildProcess(std::function<void(TSend const&)> const& work, int signalOfOrphan);
 
-  // The same for work that sends one text at its end. Work that throws sends nothing.
+  // The same for work that returns its text, which is sent at the end. If the work throws, nothing is sent.
   TChildProcess(std::function<std::string()> const& work, int signalOfOrphan);
 
   ~TChildProcess();
@@ -30,15 +30,15 @@ public:
   TChildProcess& operator=(TChildProcess&& other) noexcept;
 
   pid_t Id() const { return fId; }              // -1 after it has ended
-  int Output() const { return fOutput.get(); }  // readable when it has sent something, and at its end
+  int Output() const { return fOutput.get(); }  // for poll: readable when the child has sent data or ended
 
-  // Waits until the child sends something, and appends it to the text. False when there is nothing more to come.
+  // Blocks until the child sends data, and appends it to `text`. Returns false at the end of the data.
   bool Read(std::string& text);
 
-  // Waits until the child has ended. True when its work returned and everything was sent.
+  // Blocks until the child has ended. Returns true if its work returned and all data were sent.
   bool End();
 
-  // Ends the child at once.
+  // Kills the child immediately.
   void Kill();
 
 private:

@@ -5,7 +5,7 @@
 
 namespace NQRVZEP20::zep {
 
-// A new temporary directory. It is removed with its contents at the end unless Keep was called.
+// A new temporary directory, which the destructor removes with its contents unless Keep has been called.
 class TScratchDirectory {
 public:
   // Its name begins with `name`. Throws std::system_error when it cannot be created.

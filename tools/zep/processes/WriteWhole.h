@@ -5,7 +5,7 @@
 
 namespace NQRVZEP20::zep {
 
-// Writes the complete text, and continues after a signal. Returns false, with the reason in errno, when it cannot.
+// Writes the complete text, and resumes after a short write or a signal. Returns false on failure, with the reason in errno.
 bool WriteWhole(int fd, std::string_view text);
 
 }  // namespace NQRVZEP20::zep

@@ -10,18 +10,18 @@
 
 namespace NQRVZEP20::zep {
 
-// A file with passwords, read completely into memory that is overwritten at the end.
+// The contents of a file with passwords, in memory that is overwritten by the destructor.
 class TPrivateFile {
 public:
-  // Blocks while a pipe has no data. A file that cannot be read to its end, or is longer than 1 MiB, leaves the text empty, with
-  // the reason in Error(); after an interrupt (Interrupts.h) that is EINTR.
+  // Reads the complete file; blocks while a pipe has no data. If the file cannot be read to its end or is longer than 1 MiB,
+  // the text is empty and Error() returns the reason, which is EINTR after an interrupt (Interrupts.h).
   explicit TPrivateFile(std::string const& path);
 
   std::string_view Text() const { return {fText.data(), fText.size()}; }
-  int Error() const { return fError; }  // errno; EFBIG for a file that is too long, 0 when it was read
+  int Error() const { return fError; }  // an errno value; EFBIG for a file that is too long, 0 on success
   std::string Reason() const;           // the same as a text
 
-  // Warns on standard error, once for each path, when it is a regular file that every user may read.
+  // Prints a warning to standard error, once per path, if it is a regular file that every user may read.
   void WarnWhenOthersMayRead() const;
 
 private:
@@ -31,7 +31,8 @@ private:
   mode_t fMode = 0;
 };
 
-// The name of a file in messages. A name without a file may be a password in the wrong place: the option is named instead.
+// The name of a file for use in messages. If no such file exists, the name may be a password in the wrong place, so the option
+// is named instead.
 std::string NameOfPrivateFile(std::string const& path, std::string const& option);
 
 }  // namespace NQRVZEP20::zep

@@ -37,10 +37,10 @@ struct TWipingAllocator {
 
 using TSecretBytes = std::vector<char, TWipingAllocator<char>>;
 
-// A password. Copies are deep, and each is overwritten at its end.
+// A password. Copies are deep, and each is overwritten when it is destroyed.
 //
-// The first one that is not empty protects the process, and its children without an exec, from other processes of the same user:
-// no core dump, no ptrace, no access to the memory. Each one is hidden in the output of zep (Secrets.h).
+// The first non-empty password makes the process, and children that do not call exec, inaccessible to other processes of the
+// same user: no core dump, no ptrace, no access to the memory. Every password is hidden in the output of zep (Secrets.h).
 class TSecret {
 public:
   TSecret() = default;
@@ -49,14 +49,15 @@ public:
   bool IsEmpty() const { return fBytes.empty(); }
   std::string_view View() const { return {fBytes.data(), fBytes.size()}; }
 
-  // An ordinary text for the library, which accepts nothing else. Use it only in a child that ends afterwards.
+  // A std::string for the library, which accepts nothing else. It is not overwritten, so use it only in a child process that
+  // exits afterwards.
   std::string ForLibrary() const { return std::string(View()); }
 
 private:
   TSecretBytes fBytes;
 };
 
-// The secret in `text`, which is overwritten.
+// Moves `text` into a secret and overwrites `text`.
 TSecret SecretOf(std::string&& text);
 
 }  // namespace NQRVZEP20::zep

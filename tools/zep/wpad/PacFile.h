@@ -8,11 +8,11 @@ namespace NQRVZEP20::zep {
 
 struct TPacFile {
   std::string fText;
-  std::string fFailure;  // why the file could not be fetched; empty when it was
+  std::string fFailure;  // why the file could not be fetched; empty on success
 };
 
-// Fetches a proxy configuration file by plain HTTP, without a proxy, with the libcurl of the system: at most `mostBytes` (0: any
-// number), in at most 30 seconds.
+// Fetches a proxy configuration file over plain HTTP, without a proxy, with the system's libcurl: at most `mostBytes` bytes (0:
+// no limit). Blocks for at most 30 seconds.
 TPacFile FetchPacFile(std::string const& url, std::uint64_t mostBytes);
 
 }  // namespace NQRVZEP20::zep

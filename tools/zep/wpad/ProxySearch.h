@@ -21,8 +21,8 @@ struct TQuery {
   std::string fAddress, fHardwareAddress;
   int fSent = 0;  // messages
   std::optional<TReply> fReply;
-  std::string fUrl;      // in the reply; empty when it contains none
-  std::string fFailure;  // why no message was sent or no reply could arrive; empty when the query was just not answered
+  std::string fUrl;      // from the reply; empty if it contains none
+  std::string fFailure;  // why no message was sent or no reply could arrive; empty for an unanswered query
 };
 
 struct TSearch {
@@ -31,17 +31,18 @@ struct TSearch {
   std::string fFailure;  // why the search ended early
 };
 
-// Called once a second while the search waits for a reply, with the seconds that are left for the query.
+// Called once a second while the search waits for a reply, with the number of seconds left for the query.
 using TOnWait = std::function<void(TQuery const& query, int secondsLeft)>;
 
-// Why this process can never listen on the port of DHCP clients; empty when it can, now or later.
+// Why this process can never listen on the port of DHCP clients; empty if it can, now or later.
 std::string WhyNoListening();
 
 // Whether another program is using the port at this moment.
 bool IsPortTaken();
 
-// Performs the discovery of AutoProxyDiscovery::StartWpad without ending DHCP clients, and does not wait where no reply can
-// arrive: after a message that could not be sent, and when the port stays in use, which ends the search.
+// Performs the discovery of AutoProxyDiscovery::StartWpad, with two differences: it kills no DHCP clients, and it does not wait
+// if no reply can arrive, either because a message could not be sent or because the port stays in use (which ends the search).
+// Blocks until the search has ended.
 TSearch SearchProxy(TOnWait const& onWait);
 
 }  // namespace NQRVZEP20::zep
