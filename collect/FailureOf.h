@@ -16,7 +16,7 @@ std::string FailureOf(TWork work) {
   } catch (std::exception const& failure) {
     return failure.what();
   } catch (...) {
-    return "it threw something that is not a std::exception";
+    return "it threw an object that is not a std::exception";
   }
 }
 

@@ -110,7 +110,7 @@ private:
 
 std::string FileNameOf(TPlugIn const& plugIn) { return plugIn.fFile.substr(plugIn.fFile.rfind('/') + 1); }
 
-// Of two plug-ins that register one name, the first one counts.
+// If two plug-ins register the same name, the first one keeps it and the other one fails.
 void RefuseTakenNames(std::vector<TPlugIn>& plugIns) {
   std::map<std::string, std::string> owners;  // the files of the plug-ins, by the names of providers
   for (TPlugIn& plugIn : plugIns)
@@ -118,7 +118,7 @@ void RefuseTakenNames(std::vector<TPlugIn>& plugIns) {
       auto const [owner, isNew] = owners.emplace(run.fName, FileNameOf(plugIn));
       if (isNew || owner->second == FileNameOf(plugIn)) continue;
       run.fView.reset();
-      run.fError = "the name " + run.fName + " is registered by " + owner->second + ", which comes first";
+      run.fError = "the name " + run.fName + " is already registered by " + owner->second;
       run.fStage = NameOf(EStage::kRegistration);
     }
 }

@@ -79,7 +79,7 @@ TReportAnswer AnswerTo(TQuestion const& question, TNamespaceView const& view) {
   if (!raw.IsKnown()) return StillUnknown(raw);
   try {
     std::string const text = question.fQuery(view.Get());
-    if (WithoutOuterBlanks(text).empty()) return Unknown(kMissingNotGiven, "the provider gives a blank text", raw.fSource);
+    if (WithoutOuterBlanks(text).empty()) return Unknown(kMissingNotGiven, "the provider gives a blank value", raw.fSource);
     return TReportAnswer::Known(text, raw.fSource);
   } catch (TZEPException const& failure) {
     EZEPStatusCode const status = failure.GetStatusCode().GetCode();

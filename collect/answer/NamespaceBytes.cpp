@@ -111,7 +111,7 @@ private:
     std::string const name = cls->GetName(kNone);
     TClassPtr const superClass = cls->GetSuperClass(kNone);
     std::optional<std::size_t> const super = superClass ? NumberOf(*superClass) : std::nullopt;
-    if (superClass && !super) throw TBadAnswer("the class " + name + " comes before its superclass");
+    if (superClass && !super) throw TBadAnswer("the class " + name + " is enumerated before its superclass");
     std::size_t const number = fClasses.size();
     if (!fNumbers.emplace(FoldName(name), number).second) throw TBadAnswer("there are two classes " + name);
     std::vector<TDeclPtr> decls;

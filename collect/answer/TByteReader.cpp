@@ -45,7 +45,7 @@ std::size_t TByteReader::Count(std::uint64_t most, char const* what) {
 
 std::string_view TByteReader::Text() {
   std::uint64_t const length = Number();
-  if (length > Left()) throw TBadAnswer("a text is longer than what is left");
+  if (length > Left()) throw TBadAnswer("a string is longer than the remaining bytes");
   std::string_view const text = fBytes.substr(fAt, static_cast<std::size_t>(length));
   fAt += text.size();
   return text;

@@ -31,7 +31,7 @@ void TNamespaceReader::Read() {
   fNs.fClassesFailure = ReadEnding();
   for (std::size_t number = 0; number < fClassCount; ++number)
     if (fNs.fSupers[number] == 0) ReadTree(number);
-  if (fReader.Left() != 0) throw TBadAnswer("bytes follow the end");
+  if (fReader.Left() != 0) throw TBadAnswer("there are bytes after the end");
 }
 
 void TNamespaceReader::ReadQualifierDecls() {

@@ -119,7 +119,7 @@ void TPlugInProcess::ReadAnswer() {
       Take(*message);
     }
     if (!fMessages.IsBad()) return;
-    fWhyBad = "a message has a wrong form";
+    fWhyBad = "malformed message";
     End(EEnding::kBadAnswer);
   });
   if (!fAnswer && !fGiveUpAt) fGiveUpAt = TClock::now() + kGrace;
@@ -153,7 +153,8 @@ void TPlugInProcess::Take(TMessage const& message) {
       RunOf(message.fText);
       return;
     case EMessage::kTaken:
-      fResult.fProviders.push_back({message.fText, nullptr, 0, "the plug-in registers this name twice; the first one counts",
+      fResult.fProviders.push_back({message.fText, nullptr, 0,
+                                    "the plug-in registers this name twice; the second registration is ignored",
                                     NameOf(EStage::kRegistration), ""});
       return;
     case EMessage::kLoaded:
@@ -271,7 +272,7 @@ void TPlugInProcess::RecordUnfilled() {
   for (TProviderRun& run : fResult.fProviders)
     if (!run.fView && run.fError.empty()) {
       run.fError = fEnding == EEnding::kDone ? "not filled, because it was registered after the plug-in had been loaded"
-                                             : "not filled, because the process of the plug-in had ended";
+                                             : "not filled, because the plug-in process had ended";
       run.fStage = NameOf(EStage::kFill);
     }
 }
@@ -279,14 +280,14 @@ void TPlugInProcess::RecordUnfilled() {
 std::string TPlugInProcess::WhyDead() const {
   std::string const limit = std::to_string(fLimits.fTimeoutSeconds) + " s";
   if (fEnding == EEnding::kTimeUp) return "it exceeded the time limit of " + limit;
-  if (fEnding == EEnding::kTooLong) return "its answer exceeds " + std::to_string(fLimits.fAnswerBytes) + " bytes";
-  if (fEnding == EEnding::kBadAnswer) return "its answer cannot be read: " + fWhyBad;
+  if (fEnding == EEnding::kTooLong) return "its result exceeds " + std::to_string(fLimits.fAnswerBytes) + " bytes";
+  if (fEnding == EEnding::kBadAnswer) return "its result is invalid: " + fWhyBad;
   if (fFatal) return *fFatal;
-  if (fExitStatus) return "it ended the process with status " + *fExitStatus;
-  if (!fVerdict) return "its supervisor ended";
-  if (fEnding == EEnding::kClosed && !fVerdict->fHadEndedByItself) return "it closed the descriptor of its answer";
-  if (WIFEXITED(fVerdict->fStatus)) return "it ended the process with status " + std::to_string(WEXITSTATUS(fVerdict->fStatus));
-  return "it was ended by " + SignalText(WTERMSIG(fVerdict->fStatus));
+  if (fExitStatus) return "it exited with status " + *fExitStatus;
+  if (!fVerdict) return "its supervisor process died";
+  if (fEnding == EEnding::kClosed && !fVerdict->fHadEndedByItself) return "it closed the descriptor for its result";
+  if (WIFEXITED(fVerdict->fStatus)) return "it exited with status " + std::to_string(WEXITSTATUS(fVerdict->fStatus));
+  return "it was killed by " + SignalText(WTERMSIG(fVerdict->fStatus));
 }
 
 }  // namespace NQRVZEP20

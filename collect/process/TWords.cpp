@@ -17,7 +17,7 @@ void TWords::Add(std::string_view text) {
 
 std::string TWords::Get() const {
   if (fLeftOut == 0) return fFirst + fLast;
-  return fFirst + "\n[" + std::to_string(fLeftOut) + " bytes are left out]\n" + fLast;
+  return fFirst + "\n[" + std::to_string(fLeftOut) + " bytes omitted]\n" + fLast;
 }
 
 }  // namespace NQRVZEP20

@@ -20,7 +20,7 @@ TEST(FailureOfTest, NamesWhatWasThrown) {
 }
 
 TEST(FailureOfTest, ObjectsThatAreNotExceptionsAreCaught) {
-  EXPECT_EQ(FailureOf([] { throw 5; }), "it threw something that is not a std::exception");
+  EXPECT_EQ(FailureOf([] { throw 5; }), "it threw an object that is not a std::exception");
 }
 
 }  // namespace

@@ -97,19 +97,19 @@ TEST_F(PlugInsApartMisdeedTest, APlugInThatDiesCostsOnlyItsOwnRow) {
       InFill("Throws", "kZEPStatusAccessDenied (no disk)", "; last log line: [Error] the disk is gone"),
       InFill("ThrowsInAThread", "in a thread"),
       InFill("ThrowsWhileItMayNot", "it may not"),
-      InFill("Crashes", "it was ended by SIGSEGV (Segmentation fault)", "; last log line: [Error] about to crash"),
-      InFill("Aborts", "it was ended by SIGABRT (Aborted)"),
-      InFill("Exits", "it ended the process with status 0"),
-      InFill("ExitsAtOnce", "it ended the process with status 7"),
-      InFill("Executes", "it ended the process with status 9"),
-      InFill("Kills", "it was ended by SIGTERM (Terminated)"),
-      InFill("Closes", "it closed the descriptor of its answer"),
+      InFill("Crashes", "it was killed by SIGSEGV (Segmentation fault)", "; last log line: [Error] about to crash"),
+      InFill("Aborts", "it was killed by SIGABRT (Aborted)"),
+      InFill("Exits", "it exited with status 0"),
+      InFill("ExitsAtOnce", "it exited with status 7"),
+      InFill("Executes", "it exited with status 9"),
+      InFill("Kills", "it was killed by SIGTERM (Terminated)"),
+      InFill("Closes", "it closed the descriptor for its result"),
       InLoad("LoadThrows", "no disk today", "static construction"),
-      InLoad("LoadThrowsANumber", "it threw something that is not a std::exception", "static construction"),
-      InLoad("LoadCrashes", "it was ended by SIGSEGV (Segmentation fault)", "static construction"),
-      InLoad("LoadExits", "it ended the process with status 3", "static construction"),
-      InLoad("LoadAborts", "it was ended by SIGABRT (Aborted)", "static construction"),
-      InLoad("LoadCloses", "it closed the descriptor of its answer", "static construction"),
+      InLoad("LoadThrowsANumber", "it threw an object that is not a std::exception", "static construction"),
+      InLoad("LoadCrashes", "it was killed by SIGSEGV (Segmentation fault)", "static construction"),
+      InLoad("LoadExits", "it exited with status 3", "static construction"),
+      InLoad("LoadAborts", "it was killed by SIGABRT (Aborted)", "static construction"),
+      InLoad("LoadCloses", "it closed the descriptor for its result", "static construction"),
       InLoad("RegistrationThrows", "it has no name", "registration"),
       InLoad("Broken", fDir.Path("libBroken.nsp.so") + ": file too short", "open"),
       Filled("Healthy"),
@@ -125,7 +125,7 @@ TEST_F(PlugInsApartMisdeedTest, APlugInThatDiesCostsOnlyItsOwnRow) {
 TEST_F(PlugInsApartMisdeedTest, APlugInThatHangsIsEndedWithAllThatItStarted) {
   TLines const expected = {
       InFill("Hangs", "it exceeded the time limit of 6 s"),
-      "provider HangsAfter: not filled, because the process of the plug-in had ended (fill, libHangs.nsp.so)",
+      "provider HangsAfter: not filled, because the plug-in process had ended (fill, libHangs.nsp.so)",
       InFill("HangsBlocked", "it exceeded the time limit of 6 s"),
       InFill("Stops", "it exceeded the time limit of 6 s"),
       InLoad("LoadHangs", "it exceeded the time limit of 6 s", "static construction"),
@@ -167,7 +167,7 @@ TEST_F(PlugInsApartMisdeedTest, NoProcessOutlivesTheOwner) {
 TEST_F(PlugInsApartMisdeedTest, AnEndlessAnswerIsCutOff) {
   Add({"AnswersForever", "AnswersBroken"});
   TLines const lines = List("--answer 100000");
-  EXPECT_THAT(lines, Contains(InFill("AnswersForever", "its answer exceeds 100000 bytes")));
+  EXPECT_THAT(lines, Contains(InFill("AnswersForever", "its result exceeds 100000 bytes")));
   EXPECT_THAT(lines, Contains("provider AnswersBroken: filled root/own (1)"));
 }
 
@@ -177,7 +177,7 @@ TEST_F(PlugInsApartMisdeedTest, AnAnswerThatIsSlightlyTooLongIsNotAcceptedInPart
   int limit = 50;
   TLines lines = List("--answer 50");
   for (; std::count(lines.begin(), lines.end(), Filled("Healthy")) == 0; lines = List("--answer " + std::to_string(limit))) {
-    ASSERT_THAT(lines, Contains(InFill("Healthy", "its answer exceeds " + std::to_string(limit) + " bytes")));
+    ASSERT_THAT(lines, Contains(InFill("Healthy", "its result exceeds " + std::to_string(limit) + " bytes")));
     ASSERT_LT(limit += 20, 5000);
   }
   EXPECT_GT(limit, 50);
@@ -197,7 +197,7 @@ TEST_F(PlugInsApartMisdeedTest, WordsOfAPlugInAreCaught) {
   EXPECT_THAT(lines, Contains("words Prints: words of 17 bytes"));
   EXPECT_THAT(lines, Contains("and more"));
   EXPECT_THAT(lines, Contains("words PrintsMuch: line 0"));
-  EXPECT_THAT(lines, Contains(testing::MatchesRegex("\\[[0-9]+ bytes are left out\\]")));
+  EXPECT_THAT(lines, Contains(testing::MatchesRegex("\\[[0-9]+ bytes omitted\\]")));
   EXPECT_THAT(lines, Contains("line 99999"));
   EXPECT_THAT(lines, Contains("words CrashesAfterWords: last words"));
   EXPECT_THAT(lines, Contains("words Reads: read -1"));
@@ -218,11 +218,12 @@ TEST_F(PlugInsApartMisdeedTest, OfTwoProvidersWithOneNameTheFirstCounts) {
   Add({"TwinA", "TwinB", "RegistersTwice", "RegistersNothing"});
   TLines const lines = List("");
   EXPECT_THAT(lines, Contains("provider Twin: filled root/TwinA (1)"));
-  EXPECT_THAT(lines, Contains("provider Twin: the name Twin is registered by libTwinA.nsp.so, which comes first (registration, "
+  EXPECT_THAT(lines, Contains("provider Twin: the name Twin is already registered by libTwinA.nsp.so (registration, "
                               "libTwinB.nsp.so)"));
   EXPECT_THAT(lines, Contains(Filled("RegistersTwice")));
-  EXPECT_THAT(lines, Contains("provider RegistersTwice: the plug-in registers this name twice; the first one counts "
-                              "(registration, libRegistersTwice.nsp.so)"));
+  EXPECT_THAT(lines,
+              Contains("provider RegistersTwice: the plug-in registers this name twice; the second registration is ignored "
+                       "(registration, libRegistersTwice.nsp.so)"));
   EXPECT_THAT(lines, Contains("plug-in RegistersNothing: "));
 }
 

@@ -79,7 +79,7 @@ TEST_F(PlugInDirectoryTest, APlugInThatFailsDoesNotStopTheOthers) {
       {"works", "plug-in Test: \nprovider Test: filled root/test (0)\n"},
       {"throws", "plug-in Test: \nprovider Test: kZEPStatusAccessDenied (fill, libTest.nsp.so)\n"},
       {"throws-a-number",
-       "plug-in Test: \nprovider Test: it threw something that is not a std::exception (fill, libTest.nsp.so)\n"},
+       "plug-in Test: \nprovider Test: it threw an object that is not a std::exception (fill, libTest.nsp.so)\n"},
       {"no-namespace", "plug-in Test: \nprovider Test: it has no namespace (fill, libTest.nsp.so)\n"},
       {"is-silent", "plug-in Test: \n"},
   };

@@ -156,7 +156,7 @@ TEST(ReportTest, AProviderThatThrowsIsAReason) {
   for (auto const* rows : {&report.fIdentity, &report.fDetails})
     for (TReportRow const& row : *rows) {
       EXPECT_EQ(row.fAnswer.fMissing.fCode, "provider-failed") << row.fKey;
-      EXPECT_EQ(row.fAnswer.fMissing.fReason, "provider Test failed: it threw something that is not a std::exception");
+      EXPECT_EQ(row.fAnswer.fMissing.fReason, "provider Test failed: it threw an object that is not a std::exception");
     }
 }
 

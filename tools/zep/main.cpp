@@ -111,12 +111,11 @@ void CheckForExtras(CLI::App const& app) {
   std::vector<std::string> const words = ExtrasOf(app);
   if (words.empty()) return;
   bool const isCommand = !ChosenOf(app).get_subcommands({}).empty() && !IsOption(words.front());
-  if (isCommand && HasOnlyLetters(words.front())) throw TWrongUsage("there is no command \"" + words.front() + "\"");
-  if (isCommand) throw TWrongUsage("there is no such command");
+  if (isCommand && HasOnlyLetters(words.front())) throw TWrongUsage("unknown command \"" + words.front() + "\"");
+  if (isCommand) throw TWrongUsage("unknown command");
   auto const option = std::find_if(words.begin(), words.end(), IsOption);
-  if (option != words.end()) throw TWrongUsage("there is no option " + NameOfOption(*option));
-  throw TWrongUsage(words.size() == 1 ? "there is one argument too many"
-                                      : "there are " + std::to_string(words.size()) + " arguments too many");
+  if (option != words.end()) throw TWrongUsage("unknown option " + NameOfOption(*option));
+  throw TWrongUsage(words.size() == 1 ? "one unexpected argument" : std::to_string(words.size()) + " unexpected arguments");
 }
 
 // The three messages of CLI11 for a value that an option does not accept; they contain the value.

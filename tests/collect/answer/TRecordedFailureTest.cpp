@@ -26,7 +26,7 @@ TEST(TRecordedFailureTest, EveryKindIsThrownAgain) {
   EXPECT_STATUS(ReadAgain([] { throw TZEPException(kZEPStatusAccessDenied); }).Throw(), kZEPStatusAccessDenied);
   EXPECT_EQ(ReasonOf([] { ReadAgain([] { throw TZEPFailure(kZEPStatusFail, "why"); }).Throw(); }), "why");
   EXPECT_EQ(FailureOf([] { ReadAgain([] { throw std::logic_error("text"); }).Throw(); }), "text");
-  EXPECT_EQ(FailureOf([] { ReadAgain([] { throw 5; }).Throw(); }), "it threw something that is not a std::exception");
+  EXPECT_EQ(FailureOf([] { ReadAgain([] { throw 5; }).Throw(); }), "it threw an object that is not a std::exception");
 }
 
 TEST(TRecordedFailureTest, AStatusCodeWithoutATextBecomesFail) {

@@ -15,9 +15,9 @@ TEST(TWordsTest, AShortTextIsKeptCompletely) {
 TEST(TWordsTest, TheMiddleOfALongTextIsLeftOut) {
   TWords words(4);
   words.Add("abcdefghi");
-  EXPECT_EQ(words.Get(), "abcd\n[1 bytes are left out]\nfghi");
+  EXPECT_EQ(words.Get(), "abcd\n[1 bytes omitted]\nfghi");
   words.Add("jkl");
-  EXPECT_EQ(words.Get(), "abcd\n[4 bytes are left out]\nijkl");
+  EXPECT_EQ(words.Get(), "abcd\n[4 bytes omitted]\nijkl");
 }
 
 }  // namespace

@@ -15,7 +15,7 @@ namespace {
 
 std::string const kTable = "Interface         Address           Sent            Reply\n";
 std::string const kWillEnd =
-    "This ends the DHCP clients of this machine: every process with \"dhclient\" in its line of \"ps -e\".\n";
+    "This stops the DHCP clients of this machine: every process with \"dhclient\" in its line of \"ps -e\".\n";
 
 class ZepWpadTest : public TWpadBed {
 protected:
@@ -119,10 +119,10 @@ TEST_F(ZepWpadTest, LineOfAnotherProcessIsRefused) {
     std::filesystem::remove_all(fDir.Path("bin"));
     TRun const run = Zep(settings, kForgedLine + command + kDoesItLive);
     EXPECT_EQ(run.fOutput, "1\nlives\n");
-    EXPECT_NE(std::regex_search(run.fErrors,
-                                std::regex("zep: the line \" *[0-9]+ dhclient.*\" of \"ps -e\" is wrong: process [0-9]+ "
-                                           "is \"sleep\"\\. Nothing was ended\\. Another process may have forged the line .* "
-                                           "/proc/PID/comm and end that process\\. --no-stop leaves the DHCP clients running\n")),
+    EXPECT_NE(std::regex_search(
+                  run.fErrors, std::regex("zep: the line \" *[0-9]+ dhclient.*\" of \"ps -e\" is wrong: process [0-9]+ "
+                                          "is \"sleep\"\\. Nothing was killed\\. Another process may have forged the line .* "
+                                          "/proc/PID/comm and kill that process\\. --no-stop leaves the DHCP clients running\n")),
               false)
         << run.fErrors;
   }
@@ -136,8 +136,7 @@ TEST_F(ZepWpadTest, NumberWithLeadingZerosIsRefused) {
       "chmod +x $TMPDIR/bin/ps; ";
   TRun const run = Zep("TMPDIR=" + fDir.Path() + " ", forging + "$ZEP wpad --yes" + kDoesItLive);
   EXPECT_EQ(run.fOutput, "1\nlives\n");
-  EXPECT_TRUE(
-      std::regex_search(run.fErrors, std::regex("is wrong: 0[0-9]+ is not the number of a process\\. Nothing was ended\\.")))
+  EXPECT_TRUE(std::regex_search(run.fErrors, std::regex("is wrong: 0[0-9]+ is not a process ID\\. Nothing was killed\\.")))
       << run.fErrors;
 }
 
@@ -318,7 +317,7 @@ TEST_F(ZepWpadTest, WrongUsage) {
 TEST_F(ZepWpadTest, HelpDescribesTheDhcpClientsAndTheExitStatus) {
   TRun const run = Zep("", "$ZEP wpad --help");
   EXPECT_EQ(run.fStatus, 0);
-  EXPECT_NE(run.fOutput.find("the running DHCP clients are ended first"), std::string::npos);
+  EXPECT_NE(run.fOutput.find("the running DHCP clients are stopped first"), std::string::npos);
   EXPECT_NE(run.fOutput.find("Exit status: 0 when a URL was found"), std::string::npos);
 }
 

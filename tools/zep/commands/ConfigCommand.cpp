@@ -137,7 +137,7 @@ std::string WhyNothing(TArguments const& arguments, TSettings const& settings) {
   if (TOSSpecific::GetFileSize(kFileName) == 0) return settings.fPath + " is empty";
   if (!std::ifstream(kFileName)) return settings.fPath + " cannot be read";
   if (settings.fIsCut) return settings.fPath + " cannot be read to its end, so none of its settings is used";
-  if (!arguments.fKey) return settings.fPath + " contains no setting";
+  if (!arguments.fKey) return settings.fPath + " contains no settings";
   return settings.fPath + " does not set \"" + *arguments.fKey + "\"";
 }
 

@@ -28,7 +28,7 @@ std::string HelpOf(CLI::App const& zep, std::vector<std::string> const& words) {
   for (std::string const& word : words) {
     before += (before.empty() ? "" : " ") + command->get_name();
     command = CommandNamed(*command, word);
-    if (command == nullptr) throw TWrongUsage("there is no such command; zep --help lists all commands");
+    if (command == nullptr) throw TWrongUsage("unknown command; zep --help lists all commands");
   }
   auto const formatter = std::dynamic_pointer_cast<CLI::Formatter>(command->get_formatter());
   return formatter->make_help(command, before.empty() ? command->get_name() : before + " " + command->get_name(),
@@ -57,7 +57,7 @@ TRun AddHelpArguments(CLI::App& command) {
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document, with the text in it");
   command.footer(
       "The same as zep --help and zep COMMAND --help.\n"
-      "Exit status: 0, or 64 when there is no such command.");
+      "Exit status: 0, or 64 for an unknown command.");
   return [zep = command.get_parent(), arguments] { return Help(*zep, *arguments); };
 }
 

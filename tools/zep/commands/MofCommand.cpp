@@ -123,8 +123,8 @@ int Mof(TArguments const& arguments) {
 
 TRun AddMofArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
-  command.add_option("file", arguments->fFile, "The MOF file; it may include files in its folder and below")->required();
-  auto* const print = command.add_flag("--print", arguments->fPrint, "Print everything that was read as one MOF text");
+  command.add_option("file", arguments->fFile, "The MOF file; it may include files in its directory and below")->required();
+  auto* const print = command.add_flag("--print", arguments->fPrint, "Print the complete schema as a single MOF text");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document")->excludes(print);
   command.footer("Exit status: 0 when the schema is correct, 1 when it is not, 64 for wrong usage.");
   return [arguments] { return Mof(*arguments); };

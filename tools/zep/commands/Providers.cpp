@@ -41,15 +41,16 @@ void AddPlugInOptions(CLI::App& command, TPlugInArguments& arguments) {
   auto* const timeout =
       command
           .add_option("--plugin-timeout", arguments.fTimeoutSeconds,
-                      "The time in seconds that a plug-in may take to load, and again to fill its namespaces (60)")
+                      "The time limit in seconds for loading a plug-in, and again for filling its namespaces (default 60)")
           ->check(CLI::Range(1, 86400));
-  auto* const memory = command
-                           .add_option("--plugin-memory", arguments.fMemoryMebibytes,
-                                       "The memory in MiB that the process of a plug-in may use in addition to that of zep")
-                           ->check(CLI::Range(1, 1048576));
+  auto* const memory =
+      command
+          .add_option("--plugin-memory", arguments.fMemoryMebibytes,
+                      "The memory in MiB that a plug-in process may use in addition to that of zep (default: no limit)")
+          ->check(CLI::Range(1, 1048576));
   command
       .add_flag("--in-process", arguments.fInProcess,
-                "Load the plug-ins into zep itself, for a debugger: one that crashes or hangs then does so to zep")
+                "Load the plug-ins into the zep process, for debugging; a plug-in that crashes or hangs then takes zep with it")
       ->excludes(timeout)
       ->excludes(memory);
 }

@@ -90,7 +90,7 @@ std::string WhyNotPrivate(int file) {
   if (::fstat(file, &status) != 0) return std::strerror(errno);
   if (!S_ISREG(status.st_mode)) return "it is not a regular file";
   if (status.st_uid != ::geteuid()) return "it belongs to another user";
-  if (status.st_nlink != 1) return "it has several names (hard links)";
+  if (status.st_nlink != 1) return "it has more than one hard link";
   if (::fchmod(file, 0600) != 0) return std::strerror(errno);
   bool const isClosed = ::fstat(file, &status) == 0 && (status.st_mode & 0077) == 0;
   return isClosed ? "" : "its file system allows other users to read it";

@@ -148,9 +148,9 @@ TRun AddReportArguments(CLI::App& command) {
   AddUploadOptions(command, arguments->fOptions);
   AddPlugInOptions(command, arguments->fPlugIns);
   command.footer(
-      "Exit status: 0 when the identity is complete (the details do not count), 2 when a part of it is missing or a\n"
-      "plug-in failed, 1 when no part of it is known or the medium could not be written and unmounted, 64 for wrong\n"
-      "usage; when the report could not be sent, the exit status of zep send.");
+      "Exit status: 0 when the identity is complete, even if details are missing, 2 when part of the identity is missing or\n"
+      "a plug-in failed, 1 when none of it is known or the medium could not be written or unmounted, 64 for wrong usage;\n"
+      "when the report could not be sent, the exit status of zep send.");
   return [arguments] { return Report(*arguments); };
 }
 

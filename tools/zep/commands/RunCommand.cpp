@@ -48,7 +48,7 @@ std::string WhyItFailed(std::string const& program, int timeout) {
   if (!IsFound(program))
     return program.find('/') != program.npos ? program + " does not exist"
                                              : program + " was not found on PATH; is it spelled right, and installed?";
-  std::string reason = program + " could not be executed, did not exit with 0 or was ended by a signal";
+  std::string reason = program + " could not be executed, did not exit with status 0 or was killed by a signal";
   if (timeout != kForEver) reason += ", or was silent for more than " + std::to_string(timeout) + " s and is left running";
   return reason;
 }

@@ -55,7 +55,7 @@ std::vector<std::string> LinesOf(std::string const& text) {
 }
 
 void AnnounceStop(std::vector<std::string> const& clients) {
-  std::cerr << "This ends the DHCP clients of this machine: every process with \"dhclient\" in its line of \"ps -e\".\n";
+  std::cerr << "This stops the DHCP clients of this machine: every process with \"dhclient\" in its line of \"ps -e\".\n";
   for (std::string const& line : clients) std::cerr << "  " << Printable(line) << "\n";
   if (clients.empty()) std::cerr << "  (none is running)\n";
 }
@@ -225,7 +225,7 @@ TRun AddWpadArguments(CLI::App& command) {
   command.add_flag("--fetch", arguments->fFetches, "Also fetch the file, over plain HTTP with libcurl, and print it");
   AddSizeOption(command, "--max-file", arguments->fMostBytes,
                 "The size limit for the file, such as 500K or 2M (default 1M); 0: no limit");
-  auto* const yes = command.add_flag("--yes", arguments->fIsConfirmed, "End the DHCP clients without confirmation");
+  auto* const yes = command.add_flag("--yes", arguments->fIsConfirmed, "Stop the DHCP clients without confirmation");
   command
       .add_flag("--no-stop", arguments->fKeepsClients,
                 "Keep the DHCP clients running; while one of them uses port 68, no answer can be received")
@@ -233,7 +233,7 @@ TRun AddWpadArguments(CLI::App& command) {
   command.footer(
       "Queries the DHCP server, by a broadcast for each interface whose name begins with \"eth\", for the URL of the proxy\n"
       "configuration file (option 252), and prints it. Only root may listen for the answer, and only one program at a time:\n"
-      "the running DHCP clients are ended first. An unanswered query takes 18 seconds: three attempts of six.\n"
+      "the running DHCP clients are stopped first. An unanswered query takes 18 seconds: three attempts of six.\n"
       "Exit status: 0 when a URL was found (with --fetch, the file as well), 2 when the file was not fetched, 1 when no URL\n"
       "was found, 64 for wrong usage.");
   return [arguments] { return Wpad(*arguments); };

@@ -112,7 +112,7 @@ TRemoteIdentity IdentityFrom(std::string const& host, std::string const& sent, b
   std::string rest = sent;
   for (std::string* field : {&identity.fType, &identity.fModel, &identity.fSerialNumber, &identity.fError})
     *field = TakeField(rest);
-  if (!isComplete) identity.fError = "the process that queried the controller ended before it was done";
+  if (!isComplete) identity.fError = "the process that queried the controller exited before it had finished";
   return identity;
 }
 

@@ -70,7 +70,7 @@ class TQuietTerminal {
 public:
   explicit TQuietTerminal(std::string const& otherwise) : fFile(::open("/dev/tty", O_RDWR | O_CLOEXEC)) {
     if (!fFile || ::tcgetattr(fFile.get(), &fSettings) != 0)
-      throw std::runtime_error("there is no terminal to ask for the password: " + otherwise);
+      throw std::runtime_error("there is no terminal on which to prompt for the password: " + otherwise);
     termios settings = fSettings;
     settings.c_lflag &= ~static_cast<tcflag_t>(ECHO);
     ::tcsetattr(fFile.get(), TCSAFLUSH, &settings);

@@ -55,13 +55,13 @@ bool IsStillListed(std::string const& number) {
   return std::any_of(lines.begin(), lines.end(), [&](std::string const& line) { return ProcessNumberOf(line) == number; });
 }
 
-// Why the process with that number must not be ended; empty when it may be, or when there is none.
+// Why the process with that ID must not be killed; empty if it may be, or if there is none.
 std::string WhyNotNumber(std::string const& number) {
   if (number.empty()) return "";
-  if (!IsPlainNumber(number)) return number + " is not the number of a process";
+  if (!IsPlainNumber(number)) return number + " is not a process ID";
   std::optional<std::string> const name = NameOfProcess(number);
   if (name) return name->find(kName) != name->npos ? "" : "process " + number + " is \"" + *name + "\"";
-  return IsStillListed(number) ? "there is no process " + number : "";  // otherwise it has ended since
+  return IsStillListed(number) ? "process " + number + " does not exist" : "";  // otherwise it has ended since
 }
 
 }  // namespace
@@ -71,8 +71,8 @@ std::string WhyNotToBeEnded(std::vector<std::string> const& lines) {
     std::string const why = WhyNotNumber(ProcessNumberOf(line));
     if (why.empty()) continue;
     return "the line \"" + line + "\" of \"ps -e\" is wrong: " + why +
-           ". Nothing was ended. Another process may have forged the line with a line break in its name: compare \"ps -e\" with "
-           "the names in /proc/PID/comm and end that process. --no-stop leaves the DHCP clients running";
+           ". Nothing was killed. Another process may have forged the line with a line break in its name: compare \"ps -e\" with "
+           "the names in /proc/PID/comm and kill that process. --no-stop leaves the DHCP clients running";
   }
   return "";
 }

@@ -35,38 +35,38 @@ TEST_F(ArgumentsTest, WrongUsageIsReportedWithoutRepeatingTheArguments) {
     std::string fErrors;
   };
   TRow const rows[] = {
-      {{"remote", "h", "--user", "u", "--password", "SECRET1"}, "there is no option --password"},
-      {{"remote", "h", "--user", "u", "--password=SECRET1"}, "there is no option --password"},
-      {{"remote", "h", "--user", "u", "-pSECRET1"}, "there is no option -p"},
-      {{"remote", "h", "SECRET1", "--user", "u"}, "there is one argument too many"},
-      {{"remote", "h", "SECRET1", "SECRET1", "--user", "u"}, "there are 2 arguments too many"},
+      {{"remote", "h", "--user", "u", "--password", "SECRET1"}, "unknown option --password"},
+      {{"remote", "h", "--user", "u", "--password=SECRET1"}, "unknown option --password"},
+      {{"remote", "h", "--user", "u", "-pSECRET1"}, "unknown option -p"},
+      {{"remote", "h", "SECRET1", "--user", "u"}, "one unexpected argument"},
+      {{"remote", "h", "SECRET1", "SECRET1", "--user", "u"}, "2 unexpected arguments"},
       {{"remote", "h", "--user", "u", "--parallel", "SECRET1"}, "--parallel takes INT in [1 - 1000]"},
       {{"remote", "h", "--user", "u", "--parallel", "1001"}, "--parallel takes INT in [1 - 1000]"},
       {{"remote", "h", "--user"}, "--user: 1 required TEXT missing"},
       {{"remote", "h"}, "--user is required"},
       {{"send", "--stall", "ftp://u:SECRET1@h/x", "f", "h"}, "--stall takes INT in [0 - 86400]"},
-      {{"send", "f", "h", "ftp://u:SECRET1@h/x"}, "there is one argument too many"},
-      {{"send", "f", "--", "h", "ftp://u:SECRET1@h/x"}, "there is one argument too many"},
+      {{"send", "f", "h", "ftp://u:SECRET1@h/x"}, "one unexpected argument"},
+      {{"send", "f", "--", "h", "ftp://u:SECRET1@h/x"}, "one unexpected argument"},
       {{"report", "--json=SECRET1"}, "--json takes no value"},
       {{"report", "--send", "SECRET1", "--send", "h"}, "--send: At Most 1 required but received 2"},
-      {{"run", "--password=SECRET1", "true"}, "there is no option --password"},
+      {{"run", "--password=SECRET1", "true"}, "unknown option --password"},
       {{"run", "--timeout", "SECRET1", "true"}, "--timeout takes INT in [-1 - 2147483647]"},
       {{"show", "a", "--mof", "SECRET1", "--sample"}, "--mof excludes --sample"},
       {{"show"}, "path is required"},
-      {{"SECRET1"}, "there is no such command"},
-      {{"ftp://u:SECRET1@h/x"}, "there is no such command"},
-      {{"--password", "SECRET1"}, "there is no option --password"},
-      {{"--password=SECRET1", "report"}, "there is no option --password"},
-      {{"media", "SECRET1"}, "there is no such command"},
-      {{"media", "mount", "/dev/sdz", "SECRET1"}, "there is one argument too many"},
+      {{"SECRET1"}, "unknown command"},
+      {{"ftp://u:SECRET1@h/x"}, "unknown command"},
+      {{"--password", "SECRET1"}, "unknown option --password"},
+      {{"--password=SECRET1", "report"}, "unknown option --password"},
+      {{"media", "SECRET1"}, "unknown command"},
+      {{"media", "mount", "/dev/sdz", "SECRET1"}, "one unexpected argument"},
   };
   for (TRow const& row : rows) ExpectWrongUsage(row.fArguments, row.fErrors);
 }
 
 TEST_F(ArgumentsTest, UnknownCommandIsNamed) {
-  EXPECT_EQ(Run({"bogus"}).fErrors, "zep: there is no command \"bogus\"\n");
-  EXPECT_EQ(Run({"bogus", "--json"}).fErrors, "zep: there is no command \"bogus\"\n");
-  EXPECT_EQ(Run({"media", "eject"}).fErrors, "zep: there is no command \"eject\"\n");
+  EXPECT_EQ(Run({"bogus"}).fErrors, "zep: unknown command \"bogus\"\n");
+  EXPECT_EQ(Run({"bogus", "--json"}).fErrors, "zep: unknown command \"bogus\"\n");
+  EXPECT_EQ(Run({"media", "eject"}).fErrors, "zep: unknown command \"eject\"\n");
   EXPECT_EQ(Run({}).fErrors, "zep: a command is required; zep --help lists all commands\n");
 }
 
@@ -83,7 +83,7 @@ TEST_F(ArgumentsTest, ArgumentsAreEscapedInMessages) {
     EXPECT_THAT(run.fErrors, testing::StartsWith("zep: "));
     EXPECT_EQ(run.fErrors.find('\x1b'), std::string::npos);
   }
-  EXPECT_EQ(Run({"show", "a", "--\x1b[2J"}).fErrors, "zep: there is no option --\\x1b[2J\n");
+  EXPECT_EQ(Run({"show", "a", "--\x1b[2J"}).fErrors, "zep: unknown option --\\x1b[2J\n");
 }
 
 TEST_F(ArgumentsTest, EmptyArgumentsAreRefused) {

@@ -104,7 +104,7 @@ TEST_F(ConfigTest, ReportsWhyThereAreNoSettings) {
   run = Run({});
   EXPECT_EQ(run.fStatus, 1);
   EXPECT_NE(run.fOutput.find("a comment"), std::string::npos);
-  EXPECT_EQ(run.fErrors, "zep: " + File() + " contains no setting\n");
+  EXPECT_EQ(run.fErrors, "zep: " + File() + " contains no settings\n");
 
   Write("a=1\n");
   run = Run({"b"});

@@ -228,7 +228,7 @@ TEST_F(EnvelopeTest, ADocumentThatCannotBeWrittenIsWrittenOnlyOnce) {
   TRun const wrong = fZep.Run(call);
   EXPECT_EQ(wrong.fStatus, 64);
   EXPECT_EQ(wrong.fErrors,
-            "zep: there is no option --no-such-option\nzep: standard output cannot be written: No space left on device\n");
+            "zep: unknown option --no-such-option\nzep: standard output cannot be written: No space left on device\n");
 }
 
 }  // namespace

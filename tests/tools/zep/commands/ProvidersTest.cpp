@@ -102,15 +102,15 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
   } const rows[] = {
       {"Throws", "fill", "kZEPStatusAccessDenied (no disk)", "[Error] the disk is gone"},
       {"ThrowsInAThread", "fill", "in a thread", nullptr},
-      {"Crashes", "fill", "it was ended by SIGSEGV (Segmentation fault)", "[Error] about to crash"},
-      {"Aborts", "fill", "it was ended by SIGABRT (Aborted)", nullptr},
-      {"Exits", "fill", "it ended the process with status 0", nullptr},
-      {"ExitsAtOnce", "fill", "it ended the process with status 7", nullptr},
-      {"Executes", "fill", "it ended the process with status 9", nullptr},
-      {"Closes", "fill", "it closed the descriptor of its answer", nullptr},
+      {"Crashes", "fill", "it was killed by SIGSEGV (Segmentation fault)", "[Error] about to crash"},
+      {"Aborts", "fill", "it was killed by SIGABRT (Aborted)", nullptr},
+      {"Exits", "fill", "it exited with status 0", nullptr},
+      {"ExitsAtOnce", "fill", "it exited with status 7", nullptr},
+      {"Executes", "fill", "it exited with status 9", nullptr},
+      {"Closes", "fill", "it closed the descriptor for its result", nullptr},
       {"LoadThrows", "static construction", "no disk today", nullptr},
-      {"LoadCrashes", "static construction", "it was ended by SIGSEGV (Segmentation fault)", nullptr},
-      {"LoadExits", "static construction", "it ended the process with status 3", nullptr},
+      {"LoadCrashes", "static construction", "it was killed by SIGSEGV (Segmentation fault)", nullptr},
+      {"LoadExits", "static construction", "it exited with status 3", nullptr},
       {"RegistrationThrows", "registration", "it has no name", nullptr},
   };
   for (TRow const& row : rows) Add({row.fName});
@@ -137,11 +137,11 @@ TEST_F(ProvidersTest, TheRowOfAFailureNamesFileProviderStageCauseAndLogLine) {
   TRun const run = Run({"report"});
   EXPECT_EQ(run.fStatus, 2);
   std::string const words = std::regex_replace(run.fOutput, std::regex("\\s+"), " ");
-  EXPECT_THAT(words, HasSubstr("provider Crashes failed: it was ended by SIGSEGV (Segmentation fault) (fill, "
+  EXPECT_THAT(words, HasSubstr("provider Crashes failed: it was killed by SIGSEGV (Segmentation fault) (fill, "
                                "libCrashes.nsp.so); last log line: [Error] about to crash"));
   EXPECT_EQ(Run({"classes"}).fStatus, 2);
   EXPECT_EQ(Run({"classes"}).fErrors,
-            "zep: Crashes: it was ended by SIGSEGV (Segmentation fault) (fill, libCrashes.nsp.so); last "
+            "zep: Crashes: it was killed by SIGSEGV (Segmentation fault) (fill, libCrashes.nsp.so); last "
             "log line: [Error] about to crash\n");
   EXPECT_EQ(Run({"show", "CIM_Chassis"}).fStatus, 0);
 }
@@ -169,7 +169,7 @@ TEST_F(ProvidersTest, AnEndlessAnswerIsCutOff) {
   Add({"AnswersForever"});
   TRun const run = Run({"report", "--json"});
   EXPECT_EQ(run.fStatus, 2);
-  EXPECT_EQ(FailureIn(JsonOf(run), "AnswersForever")["error"], "its answer exceeds 268435456 bytes");
+  EXPECT_EQ(FailureIn(JsonOf(run), "AnswersForever")["error"], "its result exceeds 268435456 bytes");
 }
 
 // ---- Interrupts and the terminal ----

@@ -540,9 +540,9 @@ TEST_F(ReportTest, AProviderThatFailsIsReportedAndStopsNoOther) {
     char const *fBehaviour, *fResult;
   } const rows[] = {
       {"throws", "provider Test failed: kZEPStatusAccessDenied"},
-      {"throws-a-number", "provider Test failed: it threw something that is not a std::exception"},
+      {"throws-a-number", "provider Test failed: it threw an object that is not a std::exception"},
       {"no-namespace", "provider Test failed: it has no namespace"},
-      {"fails-at-once", "provider Test failed: it threw something that is not a std::exception"},
+      {"fails-at-once", "provider Test failed: it threw an object that is not a std::exception"},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.fBehaviour);
@@ -583,7 +583,7 @@ TEST_F(ReportTest, ANamespaceThatFailsLaterIsReportedWhereItFails) {
   auto const document = JsonOf(RunWithTestProvider("fails-later", {"--json", "--in-process"}));
   EXPECT_THAT(document["instances"], IsEmpty());
   EXPECT_EQ(document["instanceFailures"][0]["provider"], "Test");
-  EXPECT_EQ(document["instanceFailures"][0]["error"], "it threw something that is not a std::exception");
+  EXPECT_EQ(document["instanceFailures"][0]["error"], "it threw an object that is not a std::exception");
 }
 
 TEST_F(ReportTest, ANamespaceWhoseClassesCannotBeReadIsReported) {
@@ -591,7 +591,7 @@ TEST_F(ReportTest, ANamespaceWhoseClassesCannotBeReadIsReported) {
   TRun const run = RunWithTestProvider("fails-later", {"--json"});
   EXPECT_EQ(run.fStatus, 1);
   auto const provider = JsonOf(run)["plugIns"][0]["providers"][0];
-  EXPECT_EQ(provider["error"], "it threw something that is not a std::exception");
+  EXPECT_EQ(provider["error"], "it threw an object that is not a std::exception");
   EXPECT_EQ(provider["stage"], "fill");
 }
 
@@ -606,7 +606,7 @@ TEST_F(ReportTest, TwoPlugInsThatRegisterOneNameAreBothNamed) {
   EXPECT_EQ(run.fStatus, 2);
   EXPECT_EQ(PlugInRowsOf(run.fOutput)[0][2], "filled root/zep/host");
   EXPECT_EQ(WithoutBlanks(PlugInRowsOf(run.fOutput)[1][2]),
-            WithoutBlanks("provider Host failed: the name Host is registered by libHost.nsp.so, which comes first (registration, "
+            WithoutBlanks("provider Host failed: the name Host is already registered by libHost.nsp.so (registration, "
                           "libTest.nsp.so)"));
 }
 

@@ -62,7 +62,7 @@ TEST_F(RunTest, EverythingAfterTheSeparatorIsTheCommand) {
 }
 
 TEST_F(RunTest, ReportsThatACommandFailed) {
-  std::string const reason = " could not be executed, did not exit with 0 or was ended by a signal\n";
+  std::string const reason = " could not be executed, did not exit with status 0 or was killed by a signal\n";
   for (std::vector<std::string> const& command :
        {std::vector<std::string>{"sh", "-c", "echo said; exit 3"}, {"sh", "-c", "echo said; kill -9 $$"}}) {
     TRun const run = Run(command);
@@ -118,7 +118,8 @@ TEST_F(RunTest, TheTimeoutLimitsSilence) {
   EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(20));
   EXPECT_EQ(run.fStatus, 1);
   EXPECT_EQ(run.fErrors,
-            "zep: sh could not be executed, did not exit with 0 or was ended by a signal, or was silent for more than 3 s and is "
+            "zep: sh could not be executed, did not exit with status 0 or was killed by a signal, or was silent for more than 3 "
+            "s and is "
             "left running\n");
   EXPECT_EQ(::kill(std::stoi(run.fOutput), SIGKILL), 0) << "the command should still run";
 }
@@ -131,7 +132,7 @@ TEST_F(RunTest, AMissingCommandOrAnInvalidTimeoutIsWrongUsage) {
   EXPECT_EQ(Run({"--", ""}).fErrors, "zep: there is no command to run\n");
   TRun const unknown = Run({"--unknown", "true"});
   EXPECT_EQ(unknown.fStatus, 64);
-  EXPECT_EQ(unknown.fErrors, "zep: there is no option --unknown\n");
+  EXPECT_EQ(unknown.fErrors, "zep: unknown option --unknown\n");
 }
 
 }  // namespace

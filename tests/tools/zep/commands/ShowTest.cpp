@@ -183,7 +183,7 @@ TEST_F(ShowTest, AProviderThatFailedIsNamed) {
   std::string const nothing = "zep: no provider has the object \"X_Odd\"\n";
   EXPECT_EQ(Run({"show", "X_Odd"}, "throws").fErrors, "zep: Test: kZEPStatusAccessDenied (fill, libTest.nsp.so)\n" + nothing);
   EXPECT_EQ(Run({"show", "X_Odd"}, "fails-later").fErrors,
-            "zep: Test: it threw something that is not a std::exception (fill, libTest.nsp.so)\n" + nothing);
+            "zep: Test: it threw an object that is not a std::exception (fill, libTest.nsp.so)\n" + nothing);
   EXPECT_EQ(Run({"show", "X_Odd", "--in-process"}, "fails-later").fErrors, "zep: Test: kZEPStatusFail\n" + nothing);
   WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
   EXPECT_EQ(Run({"show", "X_None"}).fErrors,
@@ -197,11 +197,11 @@ TEST_F(ShowTest, AProviderThatFailedIsNamed) {
 TEST_F(ShowTest, ClassesNamesANamespaceThatFailsAndShowsTheOthers) {
   TRun const run = Run({"classes", "--json"}, "fails-later");
   EXPECT_EQ(run.fStatus, 2);
-  EXPECT_EQ(run.fErrors, "zep: Test: it threw something that is not a std::exception (fill, libTest.nsp.so)\n");
+  EXPECT_EQ(run.fErrors, "zep: Test: it threw an object that is not a std::exception (fill, libTest.nsp.so)\n");
   EXPECT_EQ(JsonOf(run)["namespaces"].size(), 1u);
   TRun const inProcess = Run({"classes", "--json", "--in-process"}, "fails-later");
   EXPECT_EQ(inProcess.fStatus, 2);
-  EXPECT_EQ(inProcess.fErrors, "zep: Test: it threw something that is not a std::exception\n");
+  EXPECT_EQ(inProcess.fErrors, "zep: Test: it threw an object that is not a std::exception\n");
   EXPECT_EQ(JsonOf(inProcess)["namespaces"].size(), 1u);
 }
 

@@ -60,7 +60,7 @@ TEST(RemoteIdentityTextTest, FieldsSentByAProcessThatDidNotFinishAreKept) {
     EXPECT_EQ(identity.fType, row.fType);
     EXPECT_EQ(identity.fModel, row.fModel);
     EXPECT_EQ(identity.fSerialNumber, row.fSerialNumber);
-    EXPECT_EQ(identity.fError, "the process that queried the controller ended before it was done");
+    EXPECT_EQ(identity.fError, "the process that queried the controller exited before it had finished");
   }
 }
 
@@ -168,7 +168,8 @@ TEST_F(ZepRemoteTest, AReadErrorInTheFileOfHostsIsNotTheEndOfTheFile) {
 TEST_F(ZepRemoteTest, WithoutATerminalThePasswordNeedsAnotherSource) {
   TRun const run = Run({"host", "--user", "u"});
   EXPECT_EQ(run.fStatus, 1);
-  EXPECT_EQ(run.fErrors, "zep: there is no terminal to ask for the password: set ZEP_BMC_PASSWORD or use --password-file\n");
+  EXPECT_EQ(run.fErrors,
+            "zep: there is no terminal on which to prompt for the password: set ZEP_BMC_PASSWORD or use --password-file\n");
   std::string const absent = fZep.Path("absent");
   EXPECT_EQ(Run({"host", "--user", "u", "--password-file", absent}, fPassword).fErrors,
             "zep: the file of --password-file cannot be read: No such file or directory\n");
@@ -209,7 +210,7 @@ TEST_F(ZepRemoteTest, ADebugLogMustBeARegularFileOfTheCaller) {
   struct TRow {
     std::string fLog, fReason;
   };
-  for (TRow const& row : {TRow{link, "it is a symbolic link"}, TRow{fZep.Path("second"), "it has several names (hard links)"},
+  for (TRow const& row : {TRow{link, "it is a symbolic link"}, TRow{fZep.Path("second"), "it has more than one hard link"},
                           TRow{fifo, "it is not a regular file"}, TRow{"/dev/null", "it is not a regular file"}}) {
     TRun const run = Run({"host", "--user", "u", "--debug-log", row.fLog}, fPassword);
     EXPECT_EQ(run.fStatus, 1);

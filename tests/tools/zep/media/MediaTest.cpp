@@ -330,7 +330,7 @@ TEST_F(MediaCommandTest, InvalidNamesAreRefusedBeforeAnyProgramRuns) {
       {{"umount", "/mnt/nothing-mounted-here/"}, 1, "zep: nothing is mounted at /mnt/nothing-mounted-here\n"},
       {{"mount"}, 64, "zep: device is required"},
       {{"umount"}, 64, "zep: directory is required"},
-      {{"eject"}, 64, "zep: there is no command \"eject\""},
+      {{"eject"}, 64, "zep: unknown command \"eject\""},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(testing::PrintToString(row.fArguments));

@@ -119,7 +119,7 @@ TEST_F(AtTerminalTest, HelpIsAlsoACommand) {
   EXPECT_EQ(fZep.Run({{"help", "media", "mount"}}).fOutput, fZep.Run({{"media", "mount", "--help"}}).fOutput);
   TRun const wrong = fZep.Run({{"help", "bogus"}});
   EXPECT_EQ(wrong.fStatus, 64);
-  EXPECT_EQ(wrong.fErrors, "zep: there is no such command; zep --help lists all commands\n");
+  EXPECT_EQ(wrong.fErrors, "zep: unknown command; zep --help lists all commands\n");
 }
 
 }  // namespace

@@ -30,7 +30,7 @@ private:
 TEST(DhcpClientsTest, OnlyAPlainProcessNumberIsAccepted) {
   for (std::string const number : {"0", "02", "0000001", "12345678", "4294967298"})
     EXPECT_NE(WhyNotToBeEnded({" " + number + " ? 00:00:00 dhclient"})
-                  .find(" is wrong: " + number + " is not the number of a process. Nothing was ended."),
+                  .find(" is wrong: " + number + " is not a process ID. Nothing was killed."),
               std::string::npos)
         << number;
   EXPECT_EQ(WhyNotToBeEnded({"dhclient without a number"}), "") << "a line without a number ends no process";
@@ -41,7 +41,7 @@ TEST(DhcpClientsTest, LinesAreComparedByTheirNumber) {
   std::vector<std::string> const lines = DhcpClientLines();
   ASSERT_EQ(lines.size(), 1u);
   ASSERT_NE(lines, DhcpClientLines());
-  EXPECT_NE(WhyNotToBeEnded(lines).find(" is wrong: there is no process 9999999. Nothing was ended."), std::string::npos);
+  EXPECT_NE(WhyNotToBeEnded(lines).find(" is wrong: process 9999999 does not exist. Nothing was killed."), std::string::npos);
 }
 
 }  // namespace
