@@ -38,8 +38,8 @@ using TReportValue = std::variant<std::string, TDate, std::vector<TProcessorKind
 using TReportAnswer = TAnswer<TReportValue>;
 
 struct TReportRow {
-  std::string fKey;    // for programs: "serialNumber"
-  std::string fLabel;  // for people: "Serial number"
+  std::string fKey;    // a fixed identifier: "serialNumber"
+  std::string fLabel;  // the text to display: "Serial number"
   TReportAnswer fAnswer;
 };
 

@@ -14,8 +14,8 @@ namespace NQRVZEP20 {
 // in-memory list of important entries.
 //
 // A thread's logger has no file until the thread calls Initialize or SetLogFilename. When the thread ends, the logger is
-// destroyed and its file is closed. Every written line is flushed at once. A lock guards the list while an entry is added or
-// the list is cleared. No lock guards the threshold and the directory; set them during start-up. Operations that write a file
+// destroyed and its file is closed. Every line is flushed immediately. A lock guards the list while an entry is added or the
+// list is cleared. No lock guards the threshold and the directory; set them during start-up. Operations that write a file
 // block until the system has accepted the data.
 class ZEP_EXPORT TLogger : public ILogger {
 public:

@@ -251,7 +251,7 @@ public:
   static std::string const libx86IntrAddrFile;       // "/tmp/intr_address.tmp"
 
   // The directory of the loaded core library (the root path), without a trailing separator. Throws kZEPStatusFileSystemError
-  // when the dynamic linker does not know the library's path, or the path is longer than 511 bytes.
+  // when the dynamic linker cannot report the library's path, or the path is longer than 511 bytes.
   static std::string GetZEPRootPath();
 
   // The full paths of the plug-ins of that kind in the subdirectories of `root`, in byte order. A file is a plug-in when its
@@ -275,8 +275,9 @@ public:
   static std::string BuildSpecificationPath(std::string pluginPath, std::string kind);
   static std::string BuildSpecificationPath(std::string pluginPath);  // of the kind "pi"
 
-  // Loads a plug-in and returns the dynamic linker's handle. All symbols are resolved at once and are visible to libraries
-  // loaded later. A failure is logged as an error and throws TZEPFailure (kZEPStatusFileSystemError) with the linker's reason.
+  // Loads a plug-in and returns the dynamic linker's handle. All symbols are resolved immediately and are visible to
+  // libraries that are loaded later. A failure is logged as an error and throws TZEPFailure (kZEPStatusFileSystemError) with
+  // the linker's reason.
   static void* LoadPluginLibrary(std::string path);
 
   // Loads "<root path>/lib<baseName>.nsp.so". The provider registers itself while it is loaded. Fails as LoadPluginLibrary
@@ -408,8 +409,8 @@ public:
   // A disk is an instance whose DeviceType is "Direct Access Device". Its DeviceID is its SCSI address, written
   // "host:channel:target:lun" as Linux does, or a generic SCSI node such as "/dev/sg2", which is queried for its address. Its
   // device is the node among /dev/sda to /dev/sdz that has this address. It is a USB disk when sysfs shows a USB device above
-  // it and the kernel's list of USB devices contains that device or cannot be read. A disk that sysfs does not know is a USB
-  // disk when the list contains the word "USB" anywhere. The description consists of VendorID and ProductID.
+  // it and the kernel's list of USB devices contains that device or cannot be read. A disk that is not in sysfs is a USB disk
+  // if the list contains the word "USB" anywhere. The description consists of VendorID and ProductID.
   //
   // All disks share one mount point: only the first disk that can be mounted is mounted, and the disks after it are returned
   // with the same mount point. Kept. Nodes that cannot be queried, instances without a node and failures to mount are logged

@@ -14,7 +14,7 @@ class TMofSources {
 public:
   explicit TMofSources(TMofDocument& document) : fDocument(document) {}
 
-  // The first file, or a text instead of a file; a text cannot include files.
+  // The first file, or a string instead of a file; a string cannot include files.
   TMofFile const& OpenFirst(std::string const& path);
   TMofFile const& OpenText(std::string const& text, std::string const& name);
 
@@ -31,7 +31,7 @@ private:
   TMofFile const& Add(std::string const& name, std::string text);
 
   TMofDocument& fDocument;
-  std::filesystem::path fFolder;  // of the first file; empty for a text
+  std::filesystem::path fFolder;  // of the first file; empty for a string
   std::vector<TOpen> fOpen;       // the file being read is the last; each file includes the next
 };
 

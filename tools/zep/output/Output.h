@@ -12,7 +12,7 @@ namespace NQRVZEP20::zep {
 // reader has closed the pipe, SIGPIPE kills zep, unless the caller of zep ignores that signal.
 void WriteOutput(std::string const& text);
 
-// The same for a text that repeats arguments, which may contain a password (MessageWithoutSecrets).
+// The same for text that repeats arguments, in which passwords are hidden (MessageWithoutSecrets).
 void WriteMessage(std::string const& text);
 
 // Whether one of the two has been called: with --json, a document has then been printed, at least in part.

@@ -19,7 +19,7 @@ public:
 
   std::string_view Text() const { return {fText.data(), fText.size()}; }
   int Error() const { return fError; }  // an errno value; EFBIG for a file that is too long, 0 on success
-  std::string Reason() const;           // the same as a text
+  std::string Reason() const;           // the same in words
 
   // Prints a warning to standard error, once per path, if it is a regular file that every user may read.
   void WarnWhenOthersMayRead() const;
