@@ -37,19 +37,37 @@ bool Rename(std::string const& from, std::string const& to, bool overwrites) {
   return !fs::exists(to) && std::rename(from.c_str(), to.c_str()) == 0;
 }
 
-// The mode of the file that is replaced, or else the mode that the umask allows to a new file.
-mode_t ModeFor(std::string const& file) {
-  struct stat replaced {};
-  if (::stat(file.c_str(), &replaced) == 0) return replaced.st_mode & 0777;
+void SetMode(std::string const& path, mode_t mode) {
+  TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_CLOEXEC));
+  if (file) ::fchmod(file.get(), mode);
+}
+
+mode_t ModeOfNewFile() {
   mode_t const mask = ::umask(0);
   ::umask(mask);
   return 0666 & ~mask;
 }
 
-// A failure leaves the mode as it is: kModeOfPart, or the mode of every file on a file system without modes.
-void SetMode(std::string const& path, mode_t mode) {
-  TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_CLOEXEC));
-  if (file) ::fchmod(file.get(), mode);
+// Returns whether the file has the group now.
+bool SetGroup(int file, gid_t group) {
+  struct stat status {};
+  bool const hasGroup = ::fstat(file, &status) == 0 && status.st_gid == group;
+  return hasGroup || ::fchown(file, static_cast<uid_t>(-1), group) == 0;
+}
+
+// The mode for a file that could not get its former group. No other group gets the permissions of that group. Its members are
+// among the others now, who get no permission that the group did not have.
+mode_t WithoutGroup(mode_t mode) { return (mode & 0700) | (mode & (mode >> 3) & 07); }
+
+// Gives the part the group and the mode of the file that it replaces, or the mode that the umask allows to a new file. On a file
+// system without groups and modes nothing changes.
+void SetAccess(std::string const& part, std::string const& file) {
+  struct stat replaced {};
+  if (::stat(file.c_str(), &replaced) != 0) return SetMode(part, ModeOfNewFile());
+  TUniqueFd const opened(::open(part.c_str(), O_RDONLY | O_NOFOLLOW | O_CLOEXEC));
+  if (!opened) return;
+  mode_t const mode = replaced.st_mode & 0777;
+  ::fchmod(opened.get(), SetGroup(opened.get(), replaced.st_gid) ? mode : WithoutGroup(mode));
 }
 
 }  // namespace
@@ -82,7 +100,7 @@ std::string PartText(std::string const& part) {
 }
 
 int RenamePart(std::string const& part, std::string const& file, bool overwrites) {
-  SetMode(part, ModeFor(file));
+  SetAccess(part, file);
   if (Rename(part, file, overwrites)) return 0;
   int const error = errno;
   SetMode(part, kModeOfPart);

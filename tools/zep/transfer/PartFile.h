@@ -21,8 +21,11 @@ bool IsAsWritten(std::string const& part, TTransferState const& state);
 // The end of a message about a failed download: how much has arrived, and where it is.
 std::string PartText(std::string const& part);
 
-// Gives a complete part the name of the file, and the mode of the file that it replaces, or else that of a new file. Only with
-// `overwrites` a file is replaced. When that fails, only the owner may read the part, as before. Returns 0 or errno.
+// Gives a complete part the name of the file, which it replaces only with `overwrites`. Returns 0 or errno. After a failure only
+// the owner may read the part, as before.
+//
+// The part gets the group and the mode of the replaced file, or the mode that the umask allows to a new file. When this process
+// may not set the group, the group gets no permissions.
 int RenamePart(std::string const& part, std::string const& file, bool overwrites);
 
 }  // namespace NQRVZEP20::zep
