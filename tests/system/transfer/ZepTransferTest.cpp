@@ -1362,6 +1362,23 @@ TEST_F(ZepTransferTest, EachKindOfFailureHasItsStatus) {
             "package libcurl4\n");
 }
 
+// The server answers, but a firewall rejects the connections to the ports that it names for the data.
+TEST_F(ZepTransferTest, ARefusedDataConnectionIsNamed) {
+  WriteFile(Remote("f"), "text");
+  TServer const relay("relay.py", {"--ftp", "--no-data", "0", fServer->Port(), "0"});
+  std::string const url = fServer->UrlAt(relay.Port(), "f"), file = Local("f", "text");
+  for (std::string const& command : {"send " + file + " " + url, "get --force " + url + " " + file}) {
+    SCOPED_TRACE(command);
+    TProgramRun const run = Zep(command);
+    EXPECT_EQ(run.fExitCode, kNoConnection);
+    EXPECT_THAT(
+        run.fOutput,
+        testing::ContainsRegex(": Error connecting to Server: the server answers, but its data port cannot be reached; does a "
+                               "firewall let its passive ports through\\? \\(Failed to connect to 127.0.0.1 port [0-9]+ .*\\)"));
+    EXPECT_THAT(run.fOutput, Not(HasSubstr("the server may have a part")));
+  }
+}
+
 TEST(ZepSilentHostTest, AHostThatDoesNotAnswerIsNoConnection) {
   TTempDir const dir;
   WriteFile(dir.Path("f"), "text");

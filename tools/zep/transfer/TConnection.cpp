@@ -7,6 +7,12 @@
 
 namespace NQRVZEP20::zep {
 
+namespace {
+
+bool IsNoConnection(CURLcode code) { return code == CURLE_COULDNT_RESOLVE_HOST || code == CURLE_COULDNT_CONNECT; }
+
+}  // namespace
+
 TConnection::TConnection() {
   TLoadOutcome const& outcome = fCurl.Outcome();
   if (!outcome) {
@@ -37,7 +43,8 @@ void TConnection::SetCommandsAfter(TCommands const& commands) {
 CURLcode TConnection::Perform(std::string const& url) {
   fError[0] = '\0';
   Set(CURLOPT_URL, url.c_str());
-  return fCurl->fPerform(fHandle);
+  fCode = fCurl->fPerform(fHandle);
+  return fCode;
 }
 
 std::int64_t TConnection::RemoteTime() const {
@@ -57,9 +64,24 @@ bool TConnection::IsLost() const {
   return socket == CURL_SOCKET_BAD || ::poll(&end, 1, 0) > 0;
 }
 
+std::string TConnection::ErrorText() const {
+  if (!IsNoConnection(fCode)) return fError.data();
+  if (!IsDataPortNamed()) return "";
+  return "the server answers, but its data port cannot be reached; does a firewall let its passive ports through? (" +
+         std::string(fError.data()) + ")";
+}
+
+// Whether the last reply of an FTP server was one to PASV or EPSV, which names the port for the data.
+bool TConnection::IsDataPortNamed() const {
+  constexpr long kPassive = 227, kExtendedPassive = 229;
+  long reply = 0;
+  fCurl->fGetInfo(fHandle, CURLINFO_RESPONSE_CODE, &reply);
+  return reply == kPassive || reply == kExtendedPassive;
+}
+
 void TConnection::FailFor(CURLcode code, std::string const& errorText) {
-  if (code == CURLE_COULDNT_RESOLVE_HOST || code == CURLE_COULDNT_CONNECT)
-    throw TZEPFailure(kZEPStatusConnectionFailed, "Error connecting to Server");
+  if (IsNoConnection(code))
+    throw TZEPFailure(kZEPStatusConnectionFailed, "Error connecting to Server" + (errorText.empty() ? "" : ": " + errorText));
   throw TZEPFailure(kZEPStatusAccessDenied, "Error performing command: " + errorText);
 }
 

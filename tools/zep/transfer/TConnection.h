@@ -55,17 +55,21 @@ public:
   // Whether the connection of the last transfer has ended.
   bool IsLost() const;
 
-  // libcurl's text for a failed transfer; may be empty.
-  std::string ErrorText() const { return fError.data(); }
+  // Why the last transfer failed; may be empty. It is empty when no connection to the server could be made: WhyUnreachable finds
+  // that reason.
+  std::string ErrorText() const;
 
   // Throws the TZEPFailure for a failed transfer.
   [[noreturn]] static void FailFor(CURLcode code, std::string const& errorText);
 
 private:
+  bool IsDataPortNamed() const;
+
   TLoadedLibrary<TConnectionFunctions> const fCurl;
   CURL* fHandle = nullptr;
   std::vector<curl_slist*> fLists;
-  std::array<char, CURL_ERROR_SIZE> fError{};
+  std::array<char, CURL_ERROR_SIZE> fError{};  // libcurl's text for the last transfer
+  CURLcode fCode = CURLE_OK;                   // its result
 };
 
 }  // namespace NQRVZEP20::zep

@@ -198,7 +198,9 @@ private:
     fConnection.Set(CURLOPT_PREREQFUNCTION, &MarkBegun);
     fConnection.Set(CURLOPT_PREREQDATA, &source);
     fConnection.SetCommandsAfter(commandsAfter);
-    return fConnection.Perform(url);
+    CURLcode const code = fConnection.Perform(url);
+    if (code == CURLE_COULDNT_CONNECT) SetLeft(mark, false);  // the server is told of the file after the data connection is made
+    return code;
   }
 
   // ---- Commands ----
