@@ -545,8 +545,7 @@ TEST_F(ZepTransferTest, AnInterruptEndsTheWaitForANetrcThatIsAPipe) {
     return static_cast<bool>(writer = TUniqueFd(::open(pipe.c_str(), O_WRONLY | O_NONBLOCK | O_CLOEXEC)));
   };
   std::string const command = "send --json --netrc " + pipe + " " + Local("f", "text") + " ftp://zep@127.0.0.1/f";
-  // The first signal may arrive before zep waits.
-  TInterrupted const run = InterruptedZep(command, fDir, isRead, SIGINT, [] { return true; });
+  TInterrupted const run = InterruptedZep(command, fDir, isRead, SIGINT);
   EXPECT_EQ(run.fSignal, SIGINT);
   EXPECT_THAT(run.fOutput, AllOf(HasSubstr("\"exitStatus\": 130"), EndsWith(": interrupted\n")));
 }

@@ -4,6 +4,8 @@
 #include "core/TNeverDestroyed.h"
 #include "tools/zep/output/Failure.h"
 
+#include <poll.h>
+
 #include <array>
 #include <optional>
 
@@ -47,6 +49,14 @@ TInterruptsBlocked::TInterruptsBlocked() {
 TInterruptsBlocked::~TInterruptsBlocked() { ::sigprocmask(SIG_SETMASK, &fBefore, nullptr); }
 
 int PendingInterrupt() { return gPending; }
+
+bool WaitForInput(int file) {
+  TInterruptsBlocked const blocked;  // but not during the wait
+  pollfd waiting{file, POLLIN, 0};
+  while (PendingInterrupt() == 0)
+    if (::ppoll(&waiting, 1, nullptr, &blocked.Before()) > 0) return true;
+  return false;
+}
 
 bool IsInterruptedAtLast() {
   static TNeverDestroyed<std::optional<TInterruptsBlocked>> blocked;

@@ -29,12 +29,19 @@ public:
   TInterruptsBlocked(TInterruptsBlocked const&) = delete;
   TInterruptsBlocked& operator=(TInterruptsBlocked const&) = delete;
 
+  // The signals that were blocked before.
+  sigset_t const& Before() const { return fBefore; }
+
 private:
   sigset_t fBefore;
 };
 
 // The signal that has arrived but has not taken effect yet; 0 if there is none.
 int PendingInterrupt();
+
+// Blocks until the file can be read without blocking. Returns false as soon as an interrupt is pending, even one that arrives
+// immediately before the wait, which a blocking call would miss.
+bool WaitForInput(int file);
 
 // Call it when only the outcome remains to be printed. Returns true if an interrupt is pending, which will then end zep.
 // Otherwise signals have no effect from now on, and zep exits with the status that it prints.

@@ -26,20 +26,28 @@ std::string Octal(mode_t mode) {
   return text;
 }
 
+// Reads the next bytes. Returns their number, 0 at the end of the file, or -1 with errno, which is EINTR when an interrupt is
+// pending.
+ssize_t ReadNext(int file, TSecretBytes& chunk) {
+  while (WaitForInput(file)) {
+    ssize_t const got = ::read(file, chunk.data(), chunk.size());
+    if (got >= 0 || (errno != EINTR && errno != EAGAIN)) return got;
+  }
+  errno = EINTR;
+  return -1;
+}
+
 }  // namespace
 
 TPrivateFile::TPrivateFile(std::string const& path) : fPath(path) {
-  TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NOCTTY));
+  TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC | O_NOCTTY));
   struct stat status {};
   if (file && ::fstat(file.get(), &status) == 0) fMode = status.st_mode;
   TSecretBytes chunk(4096);
   ssize_t got = file ? 1 : -1;
   while (got > 0 && fText.size() <= kMostBytes) {
-    got = ::read(file.get(), chunk.data(), chunk.size());
-    if (got < 0 && errno == EINTR && PendingInterrupt() == 0)
-      got = 1;
-    else if (got > 0)
-      fText.insert(fText.end(), chunk.begin(), chunk.begin() + got);
+    got = ReadNext(file.get(), chunk);
+    if (got > 0) fText.insert(fText.end(), chunk.begin(), chunk.begin() + got);
   }
   if (got < 0)
     fError = errno;
