@@ -518,6 +518,7 @@ std::size_t CountOf(std::string const& word, std::string const& text) {
 // The server has logged QUIT: zep now computes the checksum. If the interrupt comes too late, zep has done its work.
 TEST_F(ZepTransferTest, AnInterruptDuringTheChecksumEndsBothDocumentAndProcess) {
   fs::create_directory(fDir.Path("tmp"));
+  constexpr char const* kSent = "the complete file is on the server; zep was interrupted before it could report the checksum";
   std::string const file = Local("f", ""), back = fDir.Path("back");
   fs::resize_file(file, 100000000);
   for (std::string const& command : {"send --json " + file + " " + Url("f"), "get --json " + Url("f") + " " + back}) {
@@ -531,6 +532,9 @@ TEST_F(ZepTransferTest, AnInterruptDuringTheChecksumEndsBothDocumentAndProcess) 
     EXPECT_EQ(document["exitStatus"], run.fSignal == 0 ? run.fExitCode : 128 + run.fSignal) << run.fOutput;
     EXPECT_TRUE(run.fSignal == SIGTERM || run.fExitCode == kComplete) << run.fOutput;
     EXPECT_EQ(document["sha256"].is_null(), run.fSignal == SIGTERM);
+    if (run.fSignal == SIGTERM) {
+      EXPECT_THAT(document["reason"], testing::StartsWith(command.rfind("send", 0) == 0 ? kSent : "interrupted; the 95.4 MiB "));
+    }
   }
   EXPECT_NE(fs::exists(back), fs::exists(back + ".part"));
   EXPECT_EQ(Zep("get --force " + Url("f") + " " + back).fExitCode, kComplete);

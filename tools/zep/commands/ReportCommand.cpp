@@ -89,7 +89,7 @@ void AddSending(TJson& document, TSentReport const& sent) {
   bool const isSent = transferred.fOutcome.fExit == kExitComplete;
   if (!isSent) {
     document["exitStatus"] = static_cast<int>(transferred.fOutcome.fExit);
-    document["reason"] = "the report was not sent: " + transferred.fOutcome.fReason;
+    document["reason"] = ReasonOf(transferred);
   }
   document["sent"] = {{"url", OrNull(transferred.fUrl)},
                       {"bytes", isSent ? TJson(transferred.fBytes) : TJson(nullptr)},

@@ -61,7 +61,8 @@ void Tell(TSentReport const& sent, bool isQuiet) {
   }
   std::string const url = transferred.fUrl.empty() ? "" : transferred.fUrl + ": ";
   std::cerr << "zep: " << url << Printable(transferred.fOutcome.fReason) << "\n";
-  if (!sent.fKeptIn.empty()) std::cerr << "zep: the report is kept in " << Printable(sent.fKeptIn) << "\n";
+  char const* const kept = transferred.fHasArrived ? "zep: a copy of the report is kept in " : "zep: the report is kept in ";
+  if (!sent.fKeptIn.empty()) std::cerr << kept << Printable(sent.fKeptIn) << "\n";
 }
 
 }  // namespace
@@ -75,6 +76,10 @@ TSentReport SendReport(TReport const& report, TTarget const& target, TTransferOp
   }
   Tell(sent, options.fQuiet);
   return sent;
+}
+
+std::string ReasonOf(TTransferred const& transferred) {
+  return (transferred.fHasArrived ? "" : "the report was not sent: ") + transferred.fOutcome.fReason;
 }
 
 }  // namespace NQRVZEP20::zep

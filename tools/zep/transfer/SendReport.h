@@ -16,4 +16,7 @@ struct TSentReport {
 // cannot be sent, for whatever reason, the file is kept.
 TSentReport SendReport(TReport const& report, TTarget const& target, TTransferOptions const& options);
 
+// Why the exit status is not 0, for the document of the report.
+std::string ReasonOf(TTransferred const& transferred);
+
 }  // namespace NQRVZEP20::zep

@@ -127,8 +127,10 @@ TTransferred Failed(TTransferred transferred, EExitStatus exit, std::string cons
 TTransferred Decided(TTransferred transferred) {
   TOutcome const outcome = transferred.fOutcome;
   if (!IsInterruptedAtLast() || outcome.fExit >= kExitHangUp) return transferred;
-  bool const isComplete = outcome.fExit == kExitComplete;
-  std::string const reason = isComplete ? "interrupted after the file had arrived" : outcome.fReason + "; interrupted";
+  transferred.fHasArrived = outcome.fExit == kExitComplete;
+  std::string const reason = transferred.fHasArrived
+                                 ? "the complete file is on the server; zep was interrupted before it could report the checksum"
+                                 : outcome.fReason + "; interrupted";
   return Failed(transferred, StatusOfInterrupt(), reason);
 }
 

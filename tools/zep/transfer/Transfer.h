@@ -45,6 +45,7 @@ struct TTransferred {
   std::string fFile;
   std::uint64_t fBytes = 0;
   std::string fSha256;                     // of the local file; when all went well
+  bool fHasArrived = false;                // of an upload that failed: its complete file is on the server
   std::vector<std::string> fLeftOnServer;  // URLs for people: what an upload may have left there beside the file
   std::string fFormerUrl;                  // the one of these that is the earlier file; empty when there is none
 };

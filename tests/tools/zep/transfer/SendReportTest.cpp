@@ -51,5 +51,14 @@ TEST(SendReportTest, IsKeptAlsoWhenSendingThrows) {
   EXPECT_EQ(ReadFile(sent.fKeptIn), Gzipped(AsText(ReportAsJson(report))));
 }
 
+TEST(SendReportTest, TheReasonTellsWhetherTheReportHasArrived) {
+  TTransferred transferred;
+  transferred.fOutcome = {kZEPStatusFail, kExitTermination, "interrupted"};
+  EXPECT_EQ(ReasonOf(transferred), "the report was not sent: interrupted");
+  transferred.fHasArrived = true;
+  transferred.fOutcome.fReason = "the complete file is on the server; zep was interrupted";
+  EXPECT_EQ(ReasonOf(transferred), "the complete file is on the server; zep was interrupted");
+}
+
 }  // namespace
 }  // namespace NQRVZEP20::zep
