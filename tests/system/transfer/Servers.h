@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// The servers that transfers are tested against: real ones on free ports of loopback, each started and ended by a test.
+// Real servers on free ports of loopback, each started and stopped by a test.
 
 #include "tests/os/HostTools.h"
 
@@ -17,8 +17,8 @@
 
 namespace NQRVZEP20 {
 
-// Waits until the condition is true, for at most two minutes: a machine under load is slow, and a test should fail rather than
-// wait for ever. Returns whether it is true.
+// Waits for at most two minutes until the condition is true, and returns whether it is. The limit is long because a machine under
+// load is slow.
 template <class TCondition>
 bool IsTrueSoon(TCondition const& condition) {
   constexpr int kTries = 24000;
@@ -27,7 +27,7 @@ bool IsTrueSoon(TCondition const& condition) {
   return condition();
 }
 
-// A TCP port of loopback that refuses connections. No other program gets it while the object exists.
+// A TCP port of loopback that refuses connections. No other program can use it while the object exists.
 class TClosedPort {
 public:
   TClosedPort() : fSocket(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0)) {
@@ -47,8 +47,8 @@ private:
   std::string fNumber;
 };
 
-// A TCP port of loopback that neither accepts nor refuses a connection, as with a firewall that drops packets: its queue, which
-// has room for one connection, is full.
+// A TCP port of loopback that neither accepts nor refuses a connection, as behind a firewall that drops packets: its queue, which
+// holds one connection, is full.
 class TSilentPort {
 public:
   TSilentPort()
@@ -70,8 +70,8 @@ private:
   std::string fNumber;
 };
 
-// A script of tests/system/transfer/servers, which runs from the construction to the destruction. It prints one line of
-// NAME=VALUE words when it is ready. A port that somebody else was quicker to take is no failure: it tries again.
+// A script of tests/system/transfer/servers, which runs while the object exists. The script prints one line of NAME=VALUE words
+// when it is ready. If another program has taken its port, it is started again.
 class TServer {
 public:
   TServer(std::string const& script, std::vector<std::string> const& arguments,
@@ -112,7 +112,7 @@ private:
 
   [[noreturn]] static void Exec(int output, std::string const& script, std::vector<std::string> const& arguments,
                                 std::map<std::string, std::string> const& environment) {
-    ::prctl(PR_SET_PDEATHSIG, SIGTERM);  // a test that dies takes its servers with it
+    ::prctl(PR_SET_PDEATHSIG, SIGTERM);  // the servers end when the test dies
     ::dup2(output, STDOUT_FILENO);
     for (auto const& [name, value] : environment) ::setenv(name.c_str(), value.c_str(), 1);
     std::string const path = SourcePath("tests/system/transfer/servers/" + script);
@@ -133,7 +133,7 @@ inline bool IsOnPath(std::string const& program) {
   return false;
 }
 
-// Why the server of that script cannot be started; empty when it can.
+// What the server of that script lacks to be started; empty if it can be started.
 inline std::string WhyNoServer(std::string const& script) {
   if (::geteuid() != 0) return "root, whom the servers need";
   for (char const* program : {"python3", "openssl", "ss"})
@@ -144,7 +144,7 @@ inline std::string WhyNoServer(std::string const& script) {
   return "";
 }
 
-// A tree that a server shows as "/"; its users must be able to reach it.
+// A directory that a server shows as "/". Its users can access it.
 class TServedTree {
 public:
   TServedTree() {
@@ -159,8 +159,8 @@ private:
   TTempDir fDir;
 };
 
-// An FTP or SFTP server with a tree of its own. Users with the password "secret": "zep", who may do everything, and one who may
-// not ("readonly" for FTP, "guest" for SFTP).
+// An FTP or SFTP server with its own directory. Its users have the password "secret": "zep" may read and write, the other one
+// ("readonly" for FTP, "guest" for SFTP) may not write.
 class TFileServer {
 public:
   explicit TFileServer(std::string const& protocol, std::map<std::string, std::string> environment = {})
@@ -178,7 +178,7 @@ public:
   std::string UrlAt(std::string const& port, std::string const& path) const {
     return fProtocol + "://" + HostAt(port) + "/" + path;
   }
-  std::string Log() const { return ReadFile(fTree.Beside("log")); }  // what the server says of each command
+  std::string Log() const { return ReadFile(fTree.Beside("log")); }  // the commands that the server logged
 
 private:
   static std::map<std::string, std::string> WithLog(std::map<std::string, std::string> environment, TServedTree const& tree) {
@@ -191,7 +191,7 @@ private:
   TServer fServer;
 };
 
-// For use in a child: no libcurl can be loaded any more. False when it may not mount.
+// For use in a child: afterwards no libcurl can be loaded. Returns false if the child may not mount.
 inline bool HideLibcurl() {
   if (::unshare(CLONE_NEWNS) != 0 || ::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) != 0) return false;
   for (char const* name : {"libcurl.so", "libcurl.so.4"})

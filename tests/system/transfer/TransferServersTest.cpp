@@ -32,12 +32,12 @@ std::string RandomBytes(std::size_t size) {
   return bytes;
 }
 
-// What an operation throws and logs.
+// Expects an operation to throw this status and to log these lines.
 void ExpectFailure(std::function<void()> const& operation, EZEPStatusCode status, TLines const& log) {
   EXPECT_EQ(LogOf([&] { EXPECT_STATUS(operation(), status); }), log);
 }
 
-// With both kinds of server in turn.
+// Each test runs with an FTP and with an SFTP server.
 class FileServerTest : public testing::TestWithParam<std::string> {
 protected:
   void SetUp() override {
@@ -61,7 +61,7 @@ protected:
   std::unique_ptr<TFileServer> fServer;
 };
 
-TEST_P(FileServerTest, FilesGoThereAndBack) {
+TEST_P(FileServerTest, FilesAreUploadedAndDownloaded) {
   int const descriptors = OpenDescriptors();
   for (std::size_t const size : {0, 1, 16384, 16385, 100000000}) {
     SCOPED_TRACE(size);
@@ -77,21 +77,21 @@ TEST_P(FileServerTest, FilesGoThereAndBack) {
   EXPECT_EQ(OpenDescriptors(), descriptors);
 }
 
-// Both open for reading, and their first byte fails.
-TEST_P(FileServerTest, AnUploadOfWhatCannotBeReadIsAccessDenied) {
+// Both can be opened, but reading their first byte fails.
+TEST_P(FileServerTest, AnUploadOfAnUnreadableFileIsAccessDenied) {
   for (std::string const& file : {fDir.Path(), std::string("/proc/self/mem")}) {
     SCOPED_TRACE(file);
     ExpectFailure([&] { Put(Url("file"), file); }, kZEPStatusAccessDenied,
                   {kPerforming + "the local file cannot be read to its end"});
-    EXPECT_EQ(fs::file_size(RemoteFile("file")), 0u) << "what was read until then";
+    EXPECT_EQ(fs::file_size(RemoteFile("file")), 0u) << "no byte was read";
   }
 }
 
-TEST_P(FileServerTest, NamesAreThoseOfUrls) {
+TEST_P(FileServerTest, NamesAreDecodedFromTheUrl) {
   std::string const file = LocalFile("text");
   Put(Url("a%20b%2Bc%25%23"), file);
   EXPECT_EQ(ReadFile(RemoteFile("a b+c%#")), "text");
-  // A blank as it is, and an end of line that would begin another command.
+  // A space that is not encoded, and line ends that would begin another command.
   for (char const* name : {"a b", "a\r\nDELE%20x", "a\nb"})
     ExpectFailure([&] { Put(Url(name), file); }, kZEPStatusAccessDenied, {kPerforming});
   if (IsFtp())
@@ -99,7 +99,7 @@ TEST_P(FileServerTest, NamesAreThoseOfUrls) {
                   {kPerforming + "path contains control characters"});
 }
 
-TEST_P(FileServerTest, MissingRemoteDirectoriesAreMade) {
+TEST_P(FileServerTest, MissingRemoteDirectoriesAreCreated) {
   Put(Url("a/b/c/file"), LocalFile("text"));
   EXPECT_EQ(ReadFile(RemoteFile("a/b/c/file")), "text");
 }
@@ -124,7 +124,7 @@ TEST_P(FileServerTest, OperationsReachTheServer) {
   }
 }
 
-TEST_P(FileServerTest, RefusalsAreDenied) {
+TEST_P(FileServerTest, ARefusalIsAccessDenied) {
   std::string const file = LocalFile("text"), refused = IsFtp() ? "readonly" : "guest";
   fs::create_directory(RemoteFile("directory"));
   auto const UrlOf = [&](std::string const& user, std::string const& password, std::string const& path) {
@@ -151,13 +151,13 @@ TEST_P(FileServerTest, ADownloadMakesMissingDirectoriesOnAnFtpServerToo) {
   EXPECT_EQ(fs::is_directory(RemoteFile("new/directory")), IsFtp());
 }
 
-TEST_P(FileServerTest, NobodyThereIsAFailedConnection) {
+TEST_P(FileServerTest, AnUnreachableServerIsAFailedConnection) {
   TClosedPort const port;
   std::string const file = LocalFile("text"), unanswered = GetParam() + "://zep:secret@127.0.0.1:" + port.Number() + "/f";
   ExpectFailure([&] { Put(unanswered, file); }, kZEPStatusConnectionFailed, {kConnecting});
   ExpectFailure([&] { Get(unanswered, fDir.Path("down")); }, kZEPStatusConnectionFailed, {kConnecting});
 
-  // Without any network: an unknown name, and an address to which no way leads.
+  // Without a network: an unknown host name, and an address without a route.
   for (char const* host : {"host.invalid", "192.0.2.1"}) {
     std::string const thrown = InChild([&]() -> std::string {
       if (::unshare(CLONE_NEWNET) != 0) return "no namespace";
@@ -168,7 +168,7 @@ TEST_P(FileServerTest, NobodyThereIsAFailedConnection) {
   }
 }
 
-TEST_P(FileServerTest, ACutConnectionIsDeniedAndThePartStays) {
+TEST_P(FileServerTest, ABrokenConnectionIsAccessDeniedAndThePartStays) {
   std::string const bytes = RandomBytes(3000000), file = LocalFile(bytes);
   Put(Url("big"), file);
   int const descriptors = OpenDescriptors();
@@ -187,9 +187,9 @@ TEST_P(FileServerTest, ACutConnectionIsDeniedAndThePartStays) {
   EXPECT_EQ(OpenDescriptors(), descriptors);
 }
 
-TEST_P(FileServerTest, AFullLocalDiskIsDenied) {
+TEST_P(FileServerTest, AFullLocalDiskIsAccessDenied) {
   NEEDS(MayMount(), "the right to mount");
-  // 65,636 bytes fit but for the last 100, which are still buffered when the last chunk was written.
+  // Of 65,636 bytes all but the last 100 fit; these are still in a buffer after the last chunk was written.
   Put(Url("big"), LocalFile(RandomBytes(3000000)));
   Put(Url("tail"), LocalFile(RandomBytes(65636)));
   fs::create_directory(fDir.Path("small"));
@@ -209,7 +209,7 @@ TEST_P(FileServerTest, AFullLocalDiskIsDenied) {
 
 INSTANTIATE_TEST_SUITE_P(Of, FileServerTest, testing::Values("ftp", "sftp"), [](auto const& name) { return name.param; });
 
-TEST(NoServerTest, WithoutLibcurlAnywhereEachCallSaysSo) {
+TEST(NoServerTest, AMissingLibcurlIsReportedByEachCall) {
   NEEDS(MayMount(), "the right to mount");
   std::string const outcome = InChild([]() -> std::string {
     if (!HideLibcurl()) return "libcurl could not be hidden";
@@ -226,7 +226,7 @@ TEST(NoServerTest, WithoutLibcurlAnywhereEachCallSaysSo) {
   EXPECT_EQ(outcome, line + line);
 }
 
-TEST(NoServerTest, AServerOfAnotherProtocolIsDenied) {
+TEST(NoServerTest, AServerOfAnotherProtocolIsAccessDenied) {
   std::string const why = WhyNoServer("ftp.sh");
   NEEDS(why.empty(), why);
   TFileServer const server("ftp");
@@ -236,7 +236,7 @@ TEST(NoServerTest, AServerOfAnotherProtocolIsDenied) {
                 kZEPStatusAccessDenied, {kPerforming + "Protocol \"gopherish\" not supported or disabled in libcurl"});
 }
 
-// A server that stops in the middle keeps the caller waiting: there is no time-out.
+// There is no time-out: a server that stops answering blocks the caller for ever.
 TEST(NoServerTest, ASilentServerIsWaitedFor) {
   std::string const why = WhyNoServer("stall.py");
   NEEDS(why.empty(), why);
@@ -265,7 +265,7 @@ protected:
         std::map<std::string, std::string>{{"WEB_PAGE", fDir.Path("page")}, {"WEB_LOG", fDir.Path("web.log")}});
   }
 
-  // The status of a check in a directory of its own, and what came back.
+  // Returns the status of a check in its own directory, and the page that was returned.
   std::pair<std::string, std::string> Check(std::string const& host, std::string const& port,
                                             std::string const& userAndPassword) {
     TTempDir const dir;
@@ -278,14 +278,14 @@ protected:
   std::unique_ptr<TServer> fProxy;
 };
 
-// Of "http://www.example.com/" the host.
+// The host of the page: for "http://www.example.com/", "www.example.com".
 std::string PageHost() {
   std::string const page = ZEP_PROXY_CHECK_PAGE;
   std::size_t const host = page.find("://") + 3;
   return page.substr(host, page.find('/', host) - host);
 }
 
-TEST_F(ProxyServerTest, ThePageComesThroughTheProxy) {
+TEST_F(ProxyServerTest, ThePageIsFetchedThroughTheProxy) {
   using testing::Pair;
   EXPECT_THAT(Check("127.0.0.1", fProxy->Port(), "zep:secret"), Pair("kZEPStatusOK", "<html>the page</html>"));
   EXPECT_THAT(ReadFile(fDir.Path("web.log")), testing::AllOf(HasSubstr("Host: " + PageHost()), HasSubstr("zep-test")));
@@ -299,7 +299,7 @@ TEST_F(ProxyServerTest, ARefusalIsSeenInTheContentOnly) {
   }
 }
 
-TEST_F(ProxyServerTest, NoProxyIsAFailedConnection) {
+TEST_F(ProxyServerTest, AnUnreachableProxyIsAFailedConnection) {
   using testing::Pair;
   TClosedPort const closed;
   std::string const& port = closed.Number();

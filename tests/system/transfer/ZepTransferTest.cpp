@@ -44,7 +44,7 @@ std::string const kZep = BuildPath("bin/zep") + " ";
 
 std::string Quoted(std::string const& word) { return "'" + word + "'"; }
 
-// zep where nobody can answer; what it prints on either output.
+// Runs zep without a terminal. The output includes standard error.
 TProgramRun Zep(std::string const& arguments) {
   return RunProgram("HOME=/nowhere NETRC= TMPDIR=" + fs::temp_directory_path().string() + " " + kZep + arguments +
                     " < /dev/null 2>&1");
@@ -89,7 +89,7 @@ protected:
     WriteFile(fDir.Path(name), text);
     return fDir.Path(name);
   }
-  // For its owner only.
+  // A local file that only its owner may read.
   std::string Private(std::string const& name, std::string const& text) const {
     fs::permissions(Local(name, text), fs::perms::owner_read | fs::perms::owner_write);
     return fDir.Path(name);
@@ -215,7 +215,8 @@ TEST_F(ZepTransferTest, OnBootableMediaItSaysWhereAHostGetsTheFile) {
   EXPECT_THAT(run.fOutput,
               testing::StartsWith("ftp://zep@127.0.0.1:" + fServer->Port() + "/hostline/toqrv/vantor/fdr_upload/f, "));
   EXPECT_EQ(ReadFile(Remote("hostline/toqrv/vantor/fdr_upload/f")), "text");
-  EXPECT_THAT(Zep("send " + Local("f", "text") + " " + Url("g")).fOutput, HasSubstr("/g, ")) << "a URL is followed to the letter";
+  EXPECT_THAT(Zep("send " + Local("f", "text") + " " + Url("g")).fOutput, HasSubstr("/g, "))
+      << "the path of a URL is used unchanged";
 }
 
 TEST_F(ZepTransferTest, ArgumentsInTheWrongOrderAreNotRepeated) {
@@ -230,7 +231,7 @@ TEST_F(ZepTransferTest, ArgumentsInTheWrongOrderAreNotRepeated) {
             "zep: the file of --netrc: No such file or directory\n");
 }
 
-TEST_F(ZepTransferTest, ABrokenDownloadIsMarked) {
+TEST_F(ZepTransferTest, AFailedDownloadLeavesAPart) {
   WriteFile(Remote("big"), std::string(3000000, 'x'));
   TServer const relay("relay.py", {"--ftp", "--control", "0", fServer->Port(), "100000"});
   std::string const file = Local("f", "old"), url = fServer->UrlAt(relay.Port(), "big");
@@ -248,14 +249,14 @@ TEST_F(ZepTransferTest, ABrokenDownloadIsMarked) {
   EXPECT_FALSE(fs::exists(Remote("up")));
 }
 
-// Text whose every byte tells where it is from.
+// A text in which each position has different contents.
 std::string Numbers(int from, int count) {
   std::string text;
   for (int n = 0; n < count; ++n) text += std::to_string(from + n) + "\n";
   return text;
 }
 
-// A relay to the FTP server. It breaks the first data connection, and only that one, after 100,000 bytes.
+// The arguments of a relay to the FTP server that breaks only the first data connection, after 100,000 bytes.
 std::vector<std::string> BreakingOnce(std::string const& serverPort, std::vector<std::string> options = {}) {
   for (char const* option : {"--ftp", "--control", "--times", "1", "0"}) options.push_back(option);
   options.push_back(serverPort);
@@ -306,7 +307,7 @@ TEST_F(ZepTransferTest, APartOfAnotherVersionIsReplaced) {
   EXPECT_EQ(run.fExitCode, kComplete) << run.fOutput;
   EXPECT_TRUE(ReadFile(file) == text);
 
-  // So is a part of unknown origin, even a longer one.
+  // A part of unknown origin is replaced as well, even if it is longer.
   fs::remove(file);
   Local("f.part", std::string(5000000, 'x'));
   SetTime(fDir.Path("f.part"), 1700000001);
@@ -314,7 +315,7 @@ TEST_F(ZepTransferTest, APartOfAnotherVersionIsReplaced) {
   EXPECT_TRUE(ReadFile(file) == text);
 }
 
-// The second run finds another version and starts it anew, which the server refuses. The part is still of the old version.
+// The second run finds another version and starts again, which the server refuses. The part still belongs to the old version.
 TEST_F(ZepTransferTest, APartKeepsTheTimeOfItsOwnVersion) {
   std::string const file = fDir.Path("f"), text(2000000, 'N');
   WriteFile(Remote("big"), std::string(2000000, 'O'));
@@ -359,7 +360,7 @@ TEST_F(ZepTransferTest, APartOfAVersionWithAnotherSizeIsReplaced) {
   EXPECT_TRUE(ReadFile(file) == text);
 }
 
-// The part is then not continued, and its name is another one's.
+// The part has no note then, and is not resumed.
 TEST_F(ZepTransferTest, AForeignFileWithTheNameOfANoteStays) {
   std::string const file = fDir.Path("f"), note = Local("f.part.from", "letters from home\n");
   WriteFile(Remote("big"), std::string(2000000, 'x'));
@@ -381,11 +382,11 @@ TEST_F(ZepTransferTest, AnUploadHasATemporaryNameUntilItIsComplete) {
   TServer const relay("relay.py", {"--ftp", "0", fServer->Port(), "100000"});
   TProgramRun const broken = Zep("send " + Local("big", std::string(3000000, 'x')) + " " + fServer->UrlAt(relay.Port(), "f"));
   EXPECT_EQ(broken.fExitCode, kNothing);
-  EXPECT_EQ(ReadFile(Remote("f")), "new") << "what was there before";
+  EXPECT_EQ(ReadFile(Remote("f")), "new") << "the earlier file";
   EXPECT_EQ(NamesIn(fServer->Tree().Path()), std::vector<std::string>{"f"}) << "the part was removed";
 }
 
-TEST(ZepRenameTest, WhereTheServerDoesNotRenameTheFileIsSentToItsPlace) {
+TEST(ZepRenameTest, WithoutRenamingTheFileIsSentToItsFinalName) {
   std::string const why = WhyNoServer("ftp.sh");
   NEEDS(why.empty(), why);
   for (char const* limit : {"<Limit RNFR RNTO>\nDenyAll\n</Limit>", "PathDenyFilter \"\\.part$\""}) {
@@ -406,9 +407,9 @@ TEST_F(ZepTransferTest, ADownloadHasASizeLimit) {
   TProgramRun run = Zep("get --max-size 1M " + Url("big") + " " + file);
   EXPECT_EQ(run.fExitCode, kNothing);
   EXPECT_THAT(run.fOutput, EndsWith(": the file is larger than 1 MiB; --max-size allows more\n"));
-  EXPECT_EQ(NamesIn(fDir.Path()), std::vector<std::string>{}) << "of no use";
+  EXPECT_EQ(NamesIn(fDir.Path()), std::vector<std::string>{}) << "a part that is too large is useless";
 
-  // A part from an earlier download stays, even when it is the whole file.
+  // The part of an earlier download stays, even if it is complete.
   fs::copy_file(Remote("big"), file + ".part");
   for (std::string const& name : {Remote("big"), file + ".part"}) SetTime(name, 1700000000);
   Local("f.part.from", "zep get: the part beside this file is the beginning of\nftp://zep@127.0.0.1:" + fServer->Port() +
@@ -439,14 +440,15 @@ TEST_F(ZepTransferTest, ADownloadOfUnknownSizeEndsAtTheSizeLimit) {
   EXPECT_EQ(fs::file_size(file), 3000000u);
 }
 
-// zep as a process that signals are sent to; what it printed, and the signal that ended it.
+// The result of a run of zep to which a signal was sent.
 struct TInterrupted {
   std::string fOutput;
   int fSignal;
   int fExitCode;  // -1: ended by a signal
 };
 
-// With `isReadyAgain` the signal is sent again and again from then on, until zep has ended. `prefix` begins the command.
+// Runs zep and sends the signal when `isReady` is true. With `isReadyAgain`, sends it repeatedly from then on until zep has
+// ended. `prefix` begins the command.
 TInterrupted InterruptedZep(std::string const& arguments, TTempDir const& dir, std::function<bool()> const& isReady, int signal,
                             std::function<bool()> const& isReadyAgain = {}, std::string const& prefix = "") {
   std::string const printed = dir.Path("printed");
@@ -515,7 +517,7 @@ std::size_t CountOf(std::string const& word, std::string const& text) {
   return count;
 }
 
-// The server has logged QUIT: zep now computes the checksum. If the interrupt comes too late, zep has done its work.
+// After the server has logged QUIT, zep computes the checksum. If the interrupt arrives later, zep ends normally.
 TEST_F(ZepTransferTest, AnInterruptDuringTheChecksumEndsBothDocumentAndProcess) {
   fs::create_directory(fDir.Path("tmp"));
   constexpr char const* kSent = "the complete file is on the server; zep was interrupted before it could report the checksum";
@@ -580,7 +582,7 @@ TEST_F(ZepTransferTest, APartThatIsNotARegularFileIsRefused) {
   EXPECT_EQ(NamesIn(fDir.Path()), std::vector<std::string>{"target"});
 }
 
-// The flags with which a process has the file open; -1 when none has.
+// The flags with which any process has opened the file; -1 if none has.
 int OpenFlagsOf(std::string const& file) {
   for (fs::directory_entry const& process : fs::directory_iterator("/proc")) {
     std::error_code gone;
@@ -594,7 +596,7 @@ int OpenFlagsOf(std::string const& file) {
   return -1;
 }
 
-// Lets every flock of this process and its children fail.
+// Makes every flock of this process and its children fail.
 bool FailLocks(int error) {
   sock_filter const code[] = {
       BPF_STMT(BPF_LD | BPF_W | BPF_ABS, offsetof(seccomp_data, nr)), BPF_JUMP(BPF_JMP | BPF_JEQ | BPF_K, SYS_flock, 0, 1),
@@ -643,7 +645,7 @@ TEST_F(ZepTransferTest, ThePartOfAnInterruptedUploadIsRemovedOrNamed) {
     }
 }
 
-// The relay withholds the command that removes the part, so that the server never answers it.
+// The relay withholds the command that removes the part, so the server never answers it.
 class ZepCleanUpTest : public ZepTransferTest {
 protected:
   std::vector<std::string> RelayArguments(std::string const& how) const {
@@ -682,8 +684,8 @@ TEST_F(ZepCleanUpTest, AfterAnInterruptItEndsAfterItsTimeOrAtASecondInterrupt) {
   }
 }
 
-// The server does not rename, so that the file is sent to the place of the earlier one. The relay breaks that, which is the
-// second sending when the server takes the temporary name.
+// The server does not rename, so the file is sent directly to the final name, where the earlier file is. The relay breaks that
+// connection, which is the second one if the server accepts the temporary name.
 TEST_F(ZepTransferTest, TheLossOfTheEarlierFileIsReported) {
   constexpr uid_t kNobody = 65534;
   struct TRow {
@@ -707,7 +709,7 @@ TEST_F(ZepTransferTest, TheLossOfTheEarlierFileIsReported) {
   }
 }
 
-TEST_F(ZepTransferTest, UnderNohupATransferSurvivesAHangUp) {
+TEST_F(ZepTransferTest, UnderNohupATransferIgnoresAHangUp) {
   TFileServer const server("ftp", {{"EXTRA_CONFIG", "TransferRate RETR 200"}});  // KiB a second
   WriteFile(server.Tree().Path("f"), std::string(500000, 'x'));
   std::string const file = fDir.Path("f");
@@ -724,9 +726,9 @@ TEST(ZepRenameTest, AFileThatTheServerDoesNotRemoveIsNamed) {
     char const* fWhat;
     std::string fKind;
     char const* fConfig;
-    char const* fBefore;   // what is there of that name
-    char const* fLeft;     // what is there of another name
-    char const* fPurpose;  // of that
+    char const* fBefore;   // the contents of the file of that name before
+    char const* fLeft;     // the contents of the file that is left
+    char const* fPurpose;  // of the file that is left
   } const rows[] = {
       {"its own temporary file", "ftp", "<Limit RNFR RNTO DELE>\nDenyAll\n</Limit>", "", "text",
        "which the upload needed for a while"},
@@ -779,7 +781,7 @@ TEST(ZepRenameTest, ADirectoryIsNotReplacedByAFile) {
   }
 }
 
-// The URL names a directory that the server does not let the user enter or list, or whose check gets no answer.
+// The URL names a directory that the user may not enter or list, or whose check gets no answer.
 class ZepHiddenDirectoryTest : public testing::Test {
 protected:
   void Start(std::string const& protocol) {
@@ -788,7 +790,7 @@ protected:
     fServer = std::make_unique<TFileServer>(protocol);
   }
 
-  // A directory with one file; it belongs to that user.
+  // Creates a directory with one file, which that user owns.
   void MakeDirectory(std::string const& name, uid_t owner, unsigned mode) const {
     std::string const path = fServer->Tree().Path(name);
     fs::create_directories(path);
@@ -877,7 +879,7 @@ TEST_F(ZepHiddenDirectoryTest, ACheckWithoutAnAnswerReplacesNothing) {
     int fExitCode;
     std::string fReason;
   };
-  TRow const rows[] = {{"--hold", "--stall 2 ", kStalled, ": nothing moved for 2 s\n"}, {"--cut", "", kNothing, "\n"}};
+  TRow const rows[] = {{"--hold", "--stall 2 ", kStalled, ": no progress for 2 s\n"}, {"--cut", "", kNothing, "\n"}};
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.fRelayOption);
     TServer const relay("relay.py", {"--ftp", row.fRelayOption, "1", "CWD uploads", "0", fServer->Port(), "1000000"});
@@ -888,8 +890,8 @@ TEST_F(ZepHiddenDirectoryTest, ACheckWithoutAnAnswerReplacesNothing) {
   }
 }
 
-// Such a file may as well be a directory that cannot be entered.
-TEST_F(ZepTransferTest, AFileThatTheServerDoesNotProveToBeOneDoesNotMakeWay) {
+// The server does not reveal whether the place has a file or a directory that cannot be entered.
+TEST_F(ZepTransferTest, AFileIsNotRenamedWithoutProofThatItIsAFile) {
   TFileServer const server("ftp", {{"EXTRA_CONFIG", "<Directory />\nAllowOverwrite off\n</Directory>"}});
   WriteFile(server.Tree().Path("f"), "old");
   TServer const relay("relay.py", {"--ftp", "--hide-size", "0", server.Port(), "1000000"});
@@ -900,8 +902,8 @@ TEST_F(ZepTransferTest, AFileThatTheServerDoesNotProveToBeOneDoesNotMakeWay) {
   EXPECT_EQ(ReadFile(server.Tree().Path("f")), "old");
 }
 
-// After the earlier file has lost its name, the relay refuses to give it to any file.
-TEST_F(ZepTransferTest, AnEmptyPlaceIsReported) {
+// After the earlier file was renamed to make way, the relay refuses to rename any file to the final name.
+TEST_F(ZepTransferTest, AMissingFileAfterFailedRenamingsIsReported) {
   TFileServer const server("ftp", {{"EXTRA_CONFIG", "<Directory />\nAllowOverwrite off\n</Directory>"}});
   std::string const tree = server.Tree().Path();
   WriteFile(tree + "/f", "old");
@@ -918,7 +920,7 @@ TEST_F(ZepTransferTest, AnEmptyPlaceIsReported) {
   EXPECT_THAT(run.fOutput, EndsWith("; no file has the name " + url + "f now: the earlier file is " + url + former + "\n"));
 }
 
-// The server opens or renames a file, and the relay loses its reply. Then the server cannot be reached, or it can again.
+// The server opens or renames a file, and the relay loses its reply. After that the server is either unreachable or reachable.
 class ZepLostReplyTest : public testing::TestWithParam<bool> {
 protected:
   void SetUp() override {
@@ -931,7 +933,7 @@ protected:
 
   std::string Tree() const { return fServer->Tree().Path("d"); }
 
-  // Sends the file through a relay that loses the reply when this has become of the files.
+  // Sends the file through a relay that loses the reply when the files on the server have reached this state.
   TProgramRun Send(std::string const& event, std::string const& files) const {
     std::vector<std::string> arguments = {"--lose", event, Tree() + "/" + files, "0", fServer->Port(), "1000000000"};
     if (IsReachableAgain()) arguments.insert(arguments.begin(), {"--times", "1"});
@@ -941,7 +943,7 @@ protected:
 
   static bool IsReachableAgain() { return GetParam(); }
 
-  // That the server has files with these contents, other than "f", and that the message and the document name them.
+  // Expects the server to have files with these contents besides "f", and the message and the document to name them.
   void ExpectLeft(TProgramRun const& run, std::vector<std::string> const& contents) const {
     std::vector<std::string> found;
     for (std::string const& name : NamesIn(Tree()))
@@ -1006,7 +1008,7 @@ TEST(ZepRenameTest, OverSftpTheModeOfAReplacedFileStays) {
     EXPECT_EQ(ModeOf(d + "/secret"), mode);
     EXPECT_EQ(ReadFile(d + "/secret"), "new");
   }
-  // A link is replaced itself.
+  // The link itself is replaced.
   EXPECT_EQ(Zep("send " + dir.Path("f") + " " + server.Url("d/latest")).fExitCode, kComplete);
   EXPECT_FALSE(fs::is_symlink(d + "/latest"));
   EXPECT_EQ(ModeOf(d + "/latest"), 0644u);
@@ -1015,8 +1017,8 @@ TEST(ZepRenameTest, OverSftpTheModeOfAReplacedFileStays) {
   EXPECT_EQ(NamesIn(d), (std::vector<std::string>{"a secret", "latest", "secret", "v1"}));
 }
 
-// A server that does not rename onto a file; the relay withholds from it the last renaming, which gives the new file its name.
-TEST_F(ZepTransferTest, AnInterruptBetweenTheRenamingsGivesTheFormerFileItsNameAgain) {
+// The server does not rename onto a file. The relay withholds the last renaming, which gives the new file its name.
+TEST_F(ZepTransferTest, AnInterruptBetweenTheRenamingsRestoresTheEarlierFile) {
   TFileServer const server("ftp", {{"EXTRA_CONFIG", "<Directory />\nAllowOverwrite off\n</Directory>"}});
   WriteFile(server.Tree().Path("f"), "old");
   std::string const file = Local("f", "new"), held = fDir.Path("held"), tree = server.Tree().Path();
@@ -1029,15 +1031,15 @@ TEST_F(ZepTransferTest, AnInterruptBetweenTheRenamingsGivesTheFormerFileItsNameA
   EXPECT_EQ(ReadFile(tree + "/f"), "old");
 }
 
-// Runs `transfer` with a stall limit in seconds that is shorter than the transfer. Under load nothing may move for as long as the
-// limit, even before the login: then the limit is tripled, and the transfer with it.
+// Runs `transfer` with a stall limit in seconds that is shorter than the transfer. Under load a transfer may stall for that long
+// even before the login; then the limit and the length of the transfer are tripled.
 TProgramRun RunLongerThanTheLimit(std::function<TProgramRun(int stallSeconds)> const& transfer) {
   TProgramRun run{"", kStalled};
   for (int stallSeconds = 2; run.fExitCode == kStalled && stallSeconds < 60; stallSeconds *= 3) run = transfer(stallSeconds);
   return run;
 }
 
-TEST_F(ZepCleanUpTest, MayTakeLongerThanAStandstill) {
+TEST_F(ZepCleanUpTest, MayTakeLongerThanTheStallLimit) {
   TServer const relay("relay.py", RelayArguments("close"));
   TProgramRun const run = RunLongerThanTheLimit([&](int stallSeconds) {
     return Zep("send --stall " + std::to_string(stallSeconds) + " --clean-up " + std::to_string(4 * stallSeconds) + " " + fFile +
@@ -1047,8 +1049,8 @@ TEST_F(ZepCleanUpTest, MayTakeLongerThanAStandstill) {
   EXPECT_THAT(run.fOutput, AllOf(HasSubstr("Error performing command: "), HasSubstr("; the server may have a part of it: ")));
 }
 
-// The process that waits for the upload runs as another user than root, and cannot look at the process that has the password.
-TEST_F(ZepTransferTest, AUserWithoutPrivilegesSeesHowAnUploadMoves) {
+// The waiting process does not run as root, and cannot inspect the process of the upload, which has the password.
+TEST_F(ZepTransferTest, AnUnprivilegedUserSeesTheProgressOfAnUpload) {
   TFileServer const server("ftp", {{"EXTRA_CONFIG", "TransferRate STOR 5000"}});  // KiB a second
   fs::permissions(fDir.Path(), static_cast<fs::perms>(0755));
   TProgramRun const run = RunLongerThanTheLimit([&](int stallSeconds) {
@@ -1070,7 +1072,7 @@ TEST_F(ZepTransferTest, ANetrcThatEveryUserMayReadIsWarnedOf) {
   EXPECT_EQ(Zep(command).fOutput, "");
 }
 
-// Root can read every file, so that a directory stands for one that cannot be read.
+// Root can read every file, so the test uses a directory as a file that cannot be read.
 TEST_F(ZepTransferTest, AnUnreadableNetrcIsReported) {
   std::string const file = Local("f", "text"), url = " ftp://zep@127.0.0.1:" + fServer->Port() + "/f";
   std::string const line = "machine 127.0.0.1 login zep password secret\n";
@@ -1093,7 +1095,7 @@ TEST_F(ZepTransferTest, AnUnreadableNetrcIsReported) {
   }
 }
 
-// Under load the download may stall before the relay has passed its 100,000 bytes: then it may stall for longer.
+// Under load the download may stall before the relay has passed 100,000 bytes; then a longer limit is tried.
 TEST_F(ZepTransferTest, ADownloadThatStallsIsEnded) {
   WriteFile(Remote("big"), std::string(30000000, 'x'));
   TServer const relay("relay.py", {"--ftp", "--how", "stall", "0", fServer->Port(), "100000"});
@@ -1107,7 +1109,7 @@ TEST_F(ZepTransferTest, ADownloadThatStallsIsEnded) {
     EXPECT_EQ(run.fExitCode, kStalled);
     if (fs::exists(part) && fs::file_size(part) == 100000) break;
   }
-  EXPECT_THAT(run.fOutput, EndsWith(": nothing moved for " + stall + " s; the 97.7 KiB that arrived are in " + part + "\n"));
+  EXPECT_THAT(run.fOutput, EndsWith(": no progress for " + stall + " s; the 97.7 KiB that arrived are in " + part + "\n"));
   EXPECT_FALSE(fs::exists(fDir.Path("f")));
 }
 
@@ -1116,7 +1118,7 @@ TEST_F(ZepTransferTest, AnUploadThatStallsIsEndedAndItsPartRemoved) {
   TServer const relay("relay.py", {"--ftp", "--how", "stall", "0", fServer->Port(), "100000"});
   TProgramRun const run = Zep("send --stall 2 --clean-up 90 " + file + " " + fServer->UrlAt(relay.Port(), "up"));
   EXPECT_EQ(run.fExitCode, kStalled);
-  EXPECT_THAT(run.fOutput, EndsWith(": nothing moved for 2 s\n"));
+  EXPECT_THAT(run.fOutput, EndsWith(": no progress for 2 s\n"));
   EXPECT_EQ(NamesIn(fServer->Tree().Path()), std::vector<std::string>());
 }
 
@@ -1133,8 +1135,8 @@ TEST(ZepSlowTransferTest, ASlowDownloadIsNotStalled) {
   EXPECT_EQ(fs::file_size(dir.Path("f")), fs::file_size(server.Tree().Path("f")));
 }
 
-// A second download into the same file does not change what the first one has fetched.
-TEST_F(ZepTransferTest, OneDownloadAtATimeHasTheFile) {
+// A second download into the same file does not change the part of the first one.
+TEST_F(ZepTransferTest, OnlyOneDownloadAtATimeWritesAFile) {
   WriteFile(Remote("f"), std::string(3000000, 'x'));
   TServer relay("relay.py", {"--ftp", "--how", "stall", "0", fServer->Port(), "100000"});
   std::string const file = fDir.Path("f"), part = file + ".part";
@@ -1198,7 +1200,7 @@ TEST_F(ZepTransferTest, OnlyTheOwnerMayReadAPart) {
   EXPECT_EQ(ModeOf(part), 0600u);
 }
 
-// The relay holds the end of the connection until the part has been changed.
+// The relay delays the end of the connection until the part has been changed.
 TEST_F(ZepTransferTest, APartThatIsNoLongerTheDownloadDoesNotReplaceTheFile) {
   WriteFile(Remote("f"), "text");
   std::string const file = Local("f", "old"), part = file + ".part", other = Local("other", "text");
@@ -1232,7 +1234,7 @@ TEST_F(ZepTransferTest, APartThatIsNoLongerTheDownloadDoesNotReplaceTheFile) {
   }
 }
 
-// Makes an empty file as soon as one of that name in the directory is deleted. Waits for at most two minutes.
+// Creates an empty file as soon as a file of that name in the directory is deleted. Waits for at most two minutes.
 void MakeWhenDeleted(int watch, std::string const& directory, std::string const& name) {
   pollfd deleted{watch, POLLIN, 0};
   if (::poll(&deleted, 1, 120000) <= 0) return;
@@ -1245,12 +1247,12 @@ void MakeWhenDeleted(int watch, std::string const& directory, std::string const&
   }
 }
 
-// The library finds the file, asks, gets no answer, and returns as if all were well.
-TEST_F(ZepTransferTest, AnotherProgramsFileIsNotTakenForTheDownload) {
+// Another program creates a file with the name of the part after zep has checked it.
+TEST_F(ZepTransferTest, AnotherProgramsFileIsNotOverwrittenByADownload) {
   WriteFile(Remote("f"), "text");
   std::string const file = fDir.Path("f");
   std::string reason;
-  for (int tries = 0; tries < 20 && reason.empty(); ++tries) {  // in most of them it comes in time
+  for (int tries = 0; tries < 20 && reason.empty(); ++tries) {  // most of them hit the right moment
     fs::remove(file);
     fs::remove(file + ".part");
     int const watch = ::inotify_init1(IN_CLOEXEC);
@@ -1298,7 +1300,7 @@ TEST_F(ZepTransferTest, AFullDiskIsNotBlamedForTheRefusalOfTheServer) {
 }
 
 #ifdef FAILING_READ
-TEST_F(ZepTransferTest, APartThatTheDiskDoesNotKeepDoesNotReplaceTheFile) {
+TEST_F(ZepTransferTest, APartThatCannotBeFlushedDoesNotReplaceTheFile) {
   WriteFile(Remote("f"), "text");
   std::string const file = Local("f", "old");
   TProgramRun const run = RunProgram("HOME=/nowhere NETRC= LD_PRELOAD=" FAILING_READ " ZEP_TEST_FAILING_SYNC=" + file + ".part " +
@@ -1393,7 +1395,7 @@ TEST(ZepSilentHostTest, AHostThatDoesNotAnswerIsNoConnection) {
                                              "get --stall 1 sftp://" + place + "/f " + dir.Path("x"),
                                              "proxy-check --stall 1 " + place};
   std::vector<TProgramRun> runs(commands.size());
-  std::vector<std::thread> running;  // at once, because each takes seconds
+  std::vector<std::thread> running;  // in parallel, because each takes seconds
   for (std::size_t n = 0; n < commands.size(); ++n) running.emplace_back([&, n] { runs[n] = Zep(commands[n]); });
   for (std::thread& one : running) one.join();
   for (std::size_t n = 0; n < commands.size(); ++n) {
@@ -1402,7 +1404,7 @@ TEST(ZepSilentHostTest, AHostThatDoesNotAnswerIsNoConnection) {
   }
 }
 
-// Both are made while the relay holds the end of the connection.
+// Both are created while the relay delays the end of the connection.
 TEST_F(ZepTransferTest, AnotherProgramsFileAndLockStayAndThePartStaysPrivate) {
   WriteFile(Remote("f"), "text");
   std::string const file = fDir.Path("f"), lock = file + ".part.lock";
@@ -1437,7 +1439,7 @@ TEST_F(ZepTransferTest, AnUnreadableFileIsNotSent) {
 }
 
 #ifdef FAILING_READ
-TEST_F(ZepTransferTest, AFileThatFailsHalfWayLeavesNothingOnTheServer) {
+TEST_F(ZepTransferTest, AFileWithAReadErrorLeavesNothingOnTheServer) {
   std::string const file = Local("f", std::string(300000, 'x'));
   TProgramRun const run =
       RunProgram("HOME=/nowhere NETRC= LD_PRELOAD=" FAILING_READ " ZEP_TEST_FAILING_BYTE=150000" +
@@ -1450,15 +1452,15 @@ TEST_F(ZepTransferTest, AFileThatFailsHalfWayLeavesNothingOnTheServer) {
 
 TEST_F(ZepTransferTest, AnAtSignInAPathIsNotAPassword) {
   std::string const file = Local("f", "text");
-  EXPECT_EQ(Zep("send " + file + " " + Url("a@b")).fExitCode, kComplete) << "behind a user";
+  EXPECT_EQ(Zep("send " + file + " " + Url("a@b")).fExitCode, kComplete) << "after a user";
   EXPECT_EQ(ReadFile(Remote("a@b")), "text");
   TClosedPort const closed;
-  EXPECT_EQ(Zep("send " + file + " ftp://127.0.0.1:" + closed.Number() + "/a%40b").fExitCode, kNoConnection) << "encoded";
-  EXPECT_NE(Zep("send " + file + " ftp://[::1]/a@b").fExitCode, kUsage) << "the colons of an address";
+  EXPECT_EQ(Zep("send " + file + " ftp://127.0.0.1:" + closed.Number() + "/a%40b").fExitCode, kNoConnection) << "percent-encoded";
+  EXPECT_NE(Zep("send " + file + " ftp://[::1]/a@b").fExitCode, kUsage) << "colons within an address";
 }
 
-// The file changes after its last byte was sent: the relay holds the renaming until then.
-TEST_F(ZepTransferTest, AFileThatChangesMeanwhileIsSentInPart) {
+// The file changes after its last byte was sent, while the relay delays the renaming.
+TEST_F(ZepTransferTest, AFileThatChangesDuringTheUploadIsReported) {
   std::string const file = fDir.Path("f"), held = fDir.Path("held"), release = fDir.Path("release");
   struct TRow {
     char const* fName;
@@ -1501,7 +1503,7 @@ TEST(ZepSftpTest, SendsAndFetchesByUrl) {
   WriteFile(dir.Path("it's \"f\""), "text 2");
   run = Zep("send --as f " + dir.Path("'it'\\''s \"f\"'") + " " + server.Url("d/"));
   EXPECT_EQ(run.fExitCode, kComplete) << run.fOutput;
-  EXPECT_EQ(ReadFile(server.Tree().Path("d/f")), "text 2") << "in the place of the other";
+  EXPECT_EQ(ReadFile(server.Tree().Path("d/f")), "text 2") << "it replaced the other file";
   run = Zep("send " + dir.Path("'it'\\''s \"f\"'") + " " + server.Url("d/"));
   EXPECT_EQ(run.fExitCode, kComplete) << run.fOutput;
   EXPECT_EQ(NamesIn(server.Tree().Path("d")), (std::vector<std::string>{"f", "it's \"f\""}));
@@ -1512,7 +1514,7 @@ TEST(ZepSftpTest, SendsAndFetchesByUrl) {
   EXPECT_EQ(ReadFile(dir.Path("back")), "text");
 }
 
-// The part is changed in between, which shows that it was continued and not fetched again.
+// The part is changed between the runs, which shows that it was resumed and not fetched again.
 TEST(ZepSftpTest, TheNextDownloadContinuesThePart) {
   std::string const why = WhyNoServer("sftp.sh");
   NEEDS(why.empty(), why);
@@ -1563,11 +1565,11 @@ TEST_F(ZepTransferTest, PasswordsComeFromNetrc) {
 struct TTerminalRun {
   std::string fShown;
   int fExitCode;
-  int fSignal = 0;       // that ended it
-  bool fEchoes = false;  // whether the terminal shows what is typed, at the end
+  int fSignal = 0;       // the signal that ended it
+  bool fEchoes = false;  // whether the terminal echoes at the end
 };
 
-// zep on a terminal, where each answer is typed when its question has appeared.
+// Runs zep on a terminal, and types each answer after its question has appeared.
 TTerminalRun ZepOnTerminal(std::vector<std::string> arguments, std::vector<std::pair<std::string, std::string>> const& answers) {
   int terminal = -1;
   pid_t const child = ::forkpty(&terminal, nullptr, nullptr, nullptr);
@@ -1614,7 +1616,7 @@ TEST_F(ZepTransferTest, OnATerminalItAsksBeforeItOverwrites) {
   EXPECT_EQ(ReadFile(file), "new");
 }
 
-TEST_F(ZepTransferTest, OnATerminalItAsksForThePasswordAndShowsNoneOfIt) {
+TEST_F(ZepTransferTest, OnATerminalItPromptsForThePasswordWithoutEcho) {
   std::string const url = "ftp://zep@127.0.0.1:" + fServer->Port() + "/f", file = Local("f", "text");
   TTerminalRun const run =
       ZepOnTerminal({"send", "--netrc", "/dev/null", file, url}, {{"Password of zep at 127.0.0.1: ", "secret\n"}});
@@ -1631,7 +1633,7 @@ TEST_F(ZepTransferTest, AnInterruptAtThePromptRestoresTheTerminal) {
   EXPECT_THAT(run.fShown, Not(HasSubstr("sec")));
 }
 
-// Ctrl-S: the terminal then takes no progress any more.
+// After Ctrl-S the terminal accepts no output.
 TEST_F(ZepTransferTest, AnInterruptEndsADownloadWhoseTerminalIsStopped) {
   WriteFile(Remote("big"), std::string(3000000, 'x'));
   TServer const relay("relay.py", {"--ftp", "--how", "stall", "0", fServer->Port(), "100000"});
@@ -1683,7 +1685,7 @@ TEST(ZepSlowTransferTest, OnATerminalItShowsProgress) {
 
 // ---- The report ----
 
-TEST(ZepReportTest, IsSentPacked) {
+TEST(ZepReportTest, IsSentCompressed) {
   std::string const why = WhyNoServer("sftp.sh");
   NEEDS(why.empty(), why);
   TFileServer const server("sftp");
@@ -1701,7 +1703,7 @@ TEST(ZepReportTest, IsSentPacked) {
   EXPECT_TRUE(fs::is_empty(dir.Path())) << "nothing is left";
 }
 
-TEST(ZepReportTest, ItsDocumentNamesWhatIsLeftOnTheServer) {
+TEST(ZepReportTest, ItsDocumentNamesTheFilesLeftOnTheServer) {
   std::string const why = WhyNoServer("ftp.sh");
   NEEDS(why.empty(), why);
   TFileServer const server("ftp", {{"EXTRA_CONFIG", "<Limit RNFR RNTO DELE>\nDenyAll\n</Limit>"}});
@@ -1767,9 +1769,9 @@ TEST(ZepProxyCheckTest, PassesOnlyWhenThePageIsReturned) {
   EXPECT_THAT(run.fOutput, EndsWith("xxx, and is larger than 1 MiB (--max-page)\n"));
   EXPECT_THAT(Zep("proxy-check --max-page 4M 127.0.0.1:" + proxy->Port()).fOutput, EndsWith("xxx\n"));
   WriteFile(dir.Path("other"), "<html>" + std::string(65536 - 6 - 3, 'x') + ZEP_PROXY_CHECK_TEXT + std::string(3000000, 'x'));
-  EXPECT_EQ(Zep("proxy-check 127.0.0.1:" + proxy->Port()).fExitCode, kComplete) << "it did come through";
+  EXPECT_EQ(Zep("proxy-check 127.0.0.1:" + proxy->Port()).fExitCode, kComplete) << "the page was returned";
 
-  // A page that repeats what the proxy was told.
+  // A page that repeats the login.
   WriteFile(dir.Path("other"), "<title>no topsecret, dXNlcjp0b3BzZWNyZXQ= or http://user:topsecret@h</title>");
   run = Zep("proxy-check user:topsecret@127.0.0.1:" + proxy->Port());
   EXPECT_THAT(run.fOutput, EndsWith("the title of the returned page is: no ***, *** or http://user:***@h\n"));
@@ -1778,8 +1780,9 @@ TEST(ZepProxyCheckTest, PassesOnlyWhenThePageIsReturned) {
     EXPECT_EQ(Zep(std::string("proxy-check ") + wrong).fExitCode, kUsage) << wrong;
 }
 
-// libcurl honours these variables, although the proxy was set. In a network of its own: a request that goes past the proxy fails.
-TEST(ZepProxyCheckTest, VariablesForOtherProgramsDoNotLeadPastTheProxy) {
+// libcurl honours these variables even if a proxy is set. The test has its own network, in which a request without the proxy
+// fails.
+TEST(ZepProxyCheckTest, TheNoProxyVariablesAreIgnored) {
   std::string const why = WhyNoServer("proxy.sh");
   NEEDS(why.empty(), why);
   TTempDir const dir;
@@ -1794,7 +1797,7 @@ TEST(ZepProxyCheckTest, VariablesForOtherProgramsDoNotLeadPastTheProxy) {
   }
 }
 
-// The page has been fetched, and zep reads it. The page consists of the first letter of the text, which makes the search slow.
+// The signal arrives while zep searches the page, which consists of the first letter of the text to make the search slow.
 TEST(ZepProxyCheckTest, AnInterruptDuringTheSearchEndsBothDocumentAndProcess) {
   std::string const why = WhyNoServer("proxy.sh");
   NEEDS(why.empty(), why);
@@ -1804,7 +1807,7 @@ TEST(ZepProxyCheckTest, AnInterruptDuringTheSearchEndsBothDocumentAndProcess) {
   fs::create_directory(dir.Path("tmp"));
   TServer const proxy("proxy.sh", {"0", "0"}, {{"WEB_PAGE", dir.Path("page")}, {"PROXY_AUTH", "none"}});
   auto const isSearched = [&] {
-    if (HasContent(dir.Path("printed"))) return true;  // this test was too slow to see it
+    if (HasContent(dir.Path("printed"))) return true;  // zep was too quick
     for (std::string const& name : NamesIn(dir.Path("tmp"))) {
       std::string const file = dir.Path("tmp/" + name + "/content.html");
       if (HasSize(file, kSize) && OpenFlagsOf(file) != -1 && (OpenFlagsOf(file) & O_ACCMODE) == O_RDONLY) return true;

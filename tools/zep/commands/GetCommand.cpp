@@ -96,10 +96,9 @@ TRun AddGetArguments(CLI::App& command) {
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
       "An existing file is overwritten only after confirmation, which requires a terminal. A symbolic link remains, and\n"
-      "its target is overwritten. Until the download is complete, the file name ends in \".part\". A failed transfer leaves "
-      "that\n"
-      "file and a note of its URL and size, \".part.from\". The next transfer from the same URL continues the file when the\n"
-      "server supports this and reports the same time (FTP: MDTM) and size; otherwise it fetches the file again.\n" +
+      "its target is overwritten. Until the download is complete, the file name ends in \".part\". A failed transfer leaves\n"
+      "that file and a note of its URL and size, \".part.from\". The next transfer from the same URL continues the file when\n"
+      "the server supports this and reports the same time (FTP: MDTM) and size; otherwise it fetches the file again.\n" +
       TransferHelp());
   return [arguments] { return Get(*arguments); };
 }

@@ -87,7 +87,7 @@ bool HasContent(std::string const& file) {
   return std::filesystem::file_size(file, absent) > 0 && !absent;
 }
 
-// Replaces libcurl's message, which names no remedy, or that of a standstill.
+// Replaces the message of libcurl, which names no remedy, or the message about a stall.
 void ExplainNoConnection(TOutcome& outcome, TRemote const& proxy) {
   constexpr int kProbeSeconds = 3;
   std::string const why = WhyUnreachable(proxy.fHost, proxy.fPort, kProbeSeconds);
@@ -158,7 +158,8 @@ TRun AddProxyCheckArguments(CLI::App& command) {
       "Fetches a web page through the proxy and checks that the returned page is the expected one.\n"
       "The password comes from netrc or from a prompt.\n"
       "Exit status: 0 when the page was returned, 1 when it was not, 64 for wrong usage, 68 when the proxy\n"
-      "is unknown or does not answer, 69 without libcurl, 75 when nothing moved for too long.");
+      "is unknown or does not answer, 69 when libcurl is missing,\n"
+      "75 when no data arrived for the seconds of --stall.");
   return [arguments] { return ProxyCheck(*arguments); };
 }
 

@@ -49,11 +49,10 @@ TRun AddSendArguments(CLI::App& command) {
       "Missing directories are created on the server. The file is sent under a temporary name, which ends in a number and\n"
       "\".part\", and is renamed when the upload is complete. This replaces a file or link of that name, but never a directory.\n"
       "The server chooses the mode of the new file; only from an SFTP server that lists the mode of the replaced file and\n"
-      "refuses to rename onto it, as OpenSSH does, does the new file get that mode. If the server refuses to rename, the file is "
-      "sent to its final name directly. When only a host is given, the\n"
-      "file goes to the directory of the user or, when ZEP_ISBOOTABLE is \"yes\", to\n"
-      "hostline/toqrv/vantor/fdr_upload.\n" +
-      TransferHelp() + " 2 when the file changed while it was sent.");
+      "refuses to rename onto it, as OpenSSH does, does the new file get that mode. If the server refuses to rename, the\n"
+      "file is sent to its final name directly. When only a host is given, the file goes to the directory of the user or,\n"
+      "when ZEP_ISBOOTABLE is \"yes\", to hostline/toqrv/vantor/fdr_upload.\n" +
+      TransferHelp() + "\nAlso 2 when the file changed during the upload.");
   return [arguments] { return Send(*arguments); };
 }
 

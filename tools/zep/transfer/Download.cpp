@@ -39,13 +39,14 @@ public:
     bool const isWholeTooLarge = code == CURLE_OK && fMostBytes > 0 && fStart > fMostBytes;
     if (code == CURLE_FILESIZE_EXCEEDED || isWholeTooLarge) fState.fIsTooLarge = true;
     if (fState.fIsTooLarge) FailFor(code);
-    if (code == CURLE_OK && !fFile) OpenPart(static_cast<std::int64_t>(fStart));  // an empty file, or nothing was missing
+    if (code == CURLE_OK && !fFile)
+      OpenPart(static_cast<std::int64_t>(fStart));  // the file is empty, or the part was already complete
     if (code == CURLE_OK && fError == 0) Flush();
     if (code != CURLE_OK || fError != 0) FailFor(code);
   }
 
 private:
-  // A part is continued when its time is in whole seconds (MarkForResuming) and it has a note.
+  // A part can be resumed if its time is in whole seconds (MarkForResuming) and it has a note.
   void FindStart() {
     struct stat status {};
     bool const isPart = fIsThere && ::lstat(fPath.c_str(), &status) == 0 && S_ISREG(status.st_mode) && status.st_size > 0;
@@ -62,18 +63,19 @@ private:
     return fConnection.Perform(fUrl);
   }
 
-  // Whether the part is the beginning of the remote file, which has that size now.
+  // Whether the part is the beginning of the remote file, whose current size is given.
   bool IsPartOf(std::int64_t remoteSize) const {
     return fConnection.RemoteTime() == fTimeOfPart && fNote == NoteFor(fShownUrl, remoteSize);
   }
 
-  // Whether the part must be replaced: it is of another file, or the server cannot start in the middle.
+  // Whether the part must be replaced: it belongs to another file, or the server cannot start in the middle.
   bool IsStartedAnew(CURLcode code) {
-    if (code == CURLE_OK) return !IsPartOf(static_cast<std::int64_t>(fStart));  // nothing was missing, if it is the same file
+    if (code == CURLE_OK)
+      return !IsPartOf(static_cast<std::int64_t>(fStart));  // no bytes arrived: complete, if it is the same file
     return fIsOther || code == CURLE_BAD_DOWNLOAD_RESUME || code == CURLE_FTP_COULDNT_USE_REST || code == CURLE_RANGE_ERROR;
   }
 
-  // Opens the part when the first bytes have arrived. False, with fError or fIsOther, when nothing may be written.
+  // Opens the part when the first bytes have arrived. Returns false, with fError or fIsOther set, if nothing may be written.
   bool Open() {
     std::int64_t const toCome = fConnection.BytesToCome();
     std::int64_t const size = toCome < 0 ? -1 : toCome + static_cast<std::int64_t>(fStart);
@@ -81,7 +83,7 @@ private:
     return !fIsOther && OpenPart(size);
   }
 
-  // Opens the part of a remote file of that size (-1: unknown). False with fError.
+  // Opens the part of a remote file of that size (-1: unknown). Returns false with fError set after a failure.
   bool OpenPart(std::int64_t size) {
     int const how = fStart > 0 ? O_APPEND : fIsThere ? O_CREAT | O_TRUNC : O_CREAT | O_EXCL;
     fFile = TUniqueFd(::open(fPath.c_str(), O_WRONLY | O_NOFOLLOW | O_CLOEXEC | how, kModeOfPart));
@@ -91,20 +93,20 @@ private:
     ::fstat(fFile.get(), &opened);
     fState.fDevice = opened.st_dev;
     fState.fInode = opened.st_ino;
-    ::fchmod(fFile.get(), kModeOfPart);  // of an earlier part; a file system without modes refuses it
+    ::fchmod(fFile.get(), kModeOfPart);  // an earlier part may have another mode; fails on a file system without modes
     if (fStart == 0) WriteNote(fPath, NoteFor(fShownUrl, size));
     fState.fRemoteTime = fConnection.RemoteTime();  // only now is it the time of what the part holds
     return true;
   }
 
-  // Some file systems report only now that a byte could not be written. Those that have no fsync say EINVAL.
+  // Some file systems report a failed write only now. Those without fsync return EINVAL.
   void Flush() {
     fState.fIsFinishing = true;
     if (::fsync(fFile.get()) != 0 && errno != EINVAL) fError = errno;
     fState.fIsFinishing = false;
   }
 
-  // libcurl's write callback. Another result than the number of bytes ends the transfer.
+  // libcurl's write callback. Any result other than the number of bytes ends the transfer.
   static std::size_t Write(char const* bytes, std::size_t size, std::size_t count, void* context) {
     TDownload& self = *static_cast<TDownload*>(context);
     std::size_t const length = size * count;
@@ -133,12 +135,12 @@ private:
   std::uint64_t const fMostBytes;
   TTransferState& fState;
   TUniqueFd fFile;
-  bool const fIsThere;            // whether a file of that name was there before
-  std::uint64_t fStart = 0;       // what is there of it
-  std::int64_t fTimeOfPart = -1;  // the time of that
-  std::string fNote;              // the note of that
-  bool fIsOther = false;          // the remote file is not the one that it came from
-  int fError = 0;                 // errno of writing
+  bool const fIsThere;            // whether the part may exist
+  std::uint64_t fStart = 0;       // the size of the part that is resumed
+  std::int64_t fTimeOfPart = -1;  // its modification time
+  std::string fNote;              // its note
+  bool fIsOther = false;          // the part does not belong to the remote file
+  int fError = 0;                 // errno of opening or writing the part
 };
 
 }  // namespace

@@ -9,7 +9,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-constexpr int kGzipFormat = 16;  // added to the bits of the window; without it zlib writes a format of its own
+constexpr int kGzipFormat = 16;  // added to the window bits; without it zlib writes the zlib format
 
 // A compressor, which owns its memory.
 class TDeflater {
@@ -34,7 +34,7 @@ private:
 
 std::string Gzipped(std::string const& bytes) {
   TDeflater deflater;
-  std::string packed(::deflateBound(deflater.Get(), bytes.size()), '\0');  // room for all, so that one call does
+  std::string packed(::deflateBound(deflater.Get(), bytes.size()), '\0');  // large enough for a single call
   deflater->next_in = reinterpret_cast<Bytef*>(const_cast<char*>(bytes.data()));
   deflater->avail_in = static_cast<uInt>(bytes.size());
   deflater->next_out = reinterpret_cast<Bytef*>(packed.data());

@@ -5,7 +5,8 @@
 
 namespace NQRVZEP20::zep {
 
-// The bytes as a gzip file has them (RFC 1952), without a name and a time. Throws std::bad_alloc when memory is short.
+// Compresses the bytes into the gzip format (RFC 1952), without a file name and a time. Throws std::bad_alloc if memory runs
+// out.
 std::string Gzipped(std::string const& bytes);
 
 }  // namespace NQRVZEP20::zep

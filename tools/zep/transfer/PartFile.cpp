@@ -55,12 +55,12 @@ bool SetGroup(int file, gid_t group) {
   return hasGroup || ::fchown(file, static_cast<uid_t>(-1), group) == 0;
 }
 
-// The mode for a file that could not get its former group. No other group gets the permissions of that group. Its members are
-// among the others now, who get no permission that the group did not have.
+// The mode for a file whose group could not be kept. The new group gets no permissions. The members of the former group are now
+// among the others, so others get no permission that the former group did not have.
 mode_t WithoutGroup(mode_t mode) { return (mode & 0700) | (mode & (mode >> 3) & 07); }
 
-// Gives the part the group and the mode of the file that it replaces, or the mode that the umask allows to a new file. On a file
-// system without groups and modes nothing changes.
+// Gives the part the group and the mode of the file that it replaces, or the mode that the umask allows for a new file. Changes
+// nothing on a file system without groups and modes.
 void SetAccess(std::string const& part, std::string const& file) {
   struct stat replaced {};
   if (::stat(file.c_str(), &replaced) != 0) return SetMode(part, ModeOfNewFile());

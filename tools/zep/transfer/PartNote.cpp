@@ -19,7 +19,7 @@ constexpr std::size_t kMostBytes = 65536;
 
 std::string NameOfNote(std::string const& part) { return part + ".from"; }
 
-// At most kMostBytes of a regular file; empty when it cannot be read.
+// The first kMostBytes of a regular file; empty if it cannot be read.
 std::string BeginningOf(std::string const& path) {
   TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC));
   struct stat status {};

@@ -6,17 +6,17 @@
 
 namespace NQRVZEP20::zep {
 
-// The note beside the part of a download names the remote file that the part is the beginning of. The note of "f.part" is
-// "f.part.from". A file of that name which is not a note, or is not a regular file, is never read, changed or removed.
+// The note of a part is a file in the same directory that names the remote file from which the part was downloaded. The note of
+// "f.part" is "f.part.from". A file of that name that is not a note, or not a regular file, is never used, changed or removed.
 
-// The text of a note. `url` has no password; `size` is that of the whole remote file in bytes, -1 when the server does not
-// report it.
+// The text of a note. `url` has no password; `size` is the size of the complete remote file in bytes, or -1 if the server does
+// not report it.
 std::string NoteFor(std::string const& url, std::int64_t size);
 
-// The text of the part's note; empty when the part has none, or it cannot be read.
+// The text of the part's note; empty if there is no note or it cannot be read.
 std::string ReadNote(std::string const& part);
 
-// Writes the note, in place of an earlier one. When that fails the part has no note.
+// Writes the note and replaces an earlier one. If this fails, the part has no note.
 void WriteNote(std::string const& part, std::string const& note);
 
 // Removes the note, if there is one.

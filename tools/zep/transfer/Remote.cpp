@@ -22,7 +22,7 @@ namespace {
 
 void CheckHost(std::string const& host) {
   if (host.empty()) throw TWrongUsage("no host is named");
-  bool const isAddress = host.front() == '[' && host.back() == ']';  // of IPv6
+  bool const isAddress = host.front() == '[' && host.back() == ']';  // an IPv6 address
   for (char const c : host)
     if (!IsUnreserved(c) && !(isAddress && std::string_view("[:]").find(c) != std::string_view::npos))
       throw TWrongUsage("the host has a character that no host name has");
@@ -52,8 +52,8 @@ void ReadAuthority(std::string const& text, TRemote& remote) {
   CheckPort(remote.fPort);
 }
 
-// "u:12/w@h" has a user and a password with a "/" in it, or else the port 12 and a path with an "@": the one would be told to a
-// host "u".
+// Refuses "u:12/w@h", which is ambiguous: "12/w" may be a password, or 12 a port and "w@h" a path. A password would be sent in
+// the path to the host "u".
 void CheckForPassword(std::string const& authority, std::string const& path) {
   bool const hasPort = authority.find(':', authority.front() == '[' ? authority.find(']') : 0) != authority.npos;
   bool const hasUser = authority.find('@') != authority.npos;
@@ -74,18 +74,18 @@ struct TLogin {
   TSecret fPassword;
 };
 
-// The words of a text, one after the other, which are not copied.
+// Splits a text into words, without copying them.
 class TWords {
 public:
   explicit TWords(std::string_view text) : fRest(text) {}
 
-  // The next word; empty at the end.
+  // Returns the next word; empty at the end.
   std::string_view Next() {
     constexpr std::string_view kBlanks = " \t\r\n\v\f";
     fRest.remove_prefix(std::min(fRest.find_first_not_of(kBlanks), fRest.size()));
     return Take(std::min(fRest.find_first_of(kBlanks), fRest.size()), 0);
   }
-  // The rest of the line.
+  // Returns the rest of the line.
   std::string_view Line() { return Take(std::min(fRest.find('\n'), fRest.size()), 1); }
   bool IsAtEnd() const { return fRest.empty(); }
 
@@ -98,8 +98,8 @@ private:
   std::string_view fRest;
 };
 
-// Reads the words behind "machine NAME" or "default", up to the next of these, which is left in `word`. `password` is that of
-// the entry.
+// Reads an entry after "machine NAME" or "default". Returns the user, and stores the password in `password` and the keyword that
+// begins the next entry in `word`.
 std::string ReadLogin(TWords& words, std::string_view& word, std::string_view& password) {
   std::string user;
   password = {};
@@ -114,7 +114,7 @@ std::string ReadLogin(TWords& words, std::string_view& word, std::string_view& p
   return user;
 }
 
-// The first entry for the host (and the user, when there is one) counts.
+// The first entry for the host, and for the user if one is given.
 TLogin LoginIn(std::string_view netrc, TRemote const& remote) {
   TWords words(netrc);
   for (std::string_view word = words.Next(); !word.empty();) {
@@ -129,7 +129,8 @@ TLogin LoginIn(std::string_view netrc, TRemote const& remote) {
   return {};
 }
 
-// Throws TWrongUsage when the file of --netrc cannot be read; warns of another one. Without ~/.netrc there is no login.
+// If the file cannot be read, throws TWrongUsage for the file of --netrc, and prints a warning for another file. A missing
+// default file is not reported.
 void CheckNetrc(TPrivateFile const& file, std::string const& path, bool isOption) {
   if (file.Error() == 0) return;
   if (isOption) throw TWrongUsage(NameOfPrivateFile(path, "--netrc") + ": " + file.Reason());
@@ -137,7 +138,7 @@ void CheckNetrc(TPrivateFile const& file, std::string const& path, bool isOption
   std::cerr << "zep: warning: " << Printable(path) << " cannot be read, and no login is taken from it: " << file.Reason() << "\n";
 }
 
-// `netrcFile`: that of --netrc, or empty.
+// `netrcFile`: the file of --netrc, or empty.
 TLogin LoginOf(TRemote const& remote, std::string const& netrcFile) {
   std::string const path = netrcFile.empty() ? DefaultNetrc() : netrcFile;
   TPrivateFile const file(path);

@@ -7,8 +7,8 @@
 
 namespace NQRVZEP20::zep {
 
-// The name of a file with the report: "zep-report-db1-20261121T041530Z" and the extension. The host name is that of the report,
-// or "unknown", in characters that every file system accepts; the time is the current one, in UTC.
+// The file name for a report: "zep-report-db1-20261121T041530Z" followed by the extension. The host name is the one in the
+// report, or "unknown"; characters that some file systems refuse are replaced. The time is the current time in UTC.
 std::string ReportFileName(TReport const& report, char const* extension);
 
 }  // namespace NQRVZEP20::zep

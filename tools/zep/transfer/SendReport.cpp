@@ -24,7 +24,7 @@ void WriteReport(TReport const& report, std::string const& file) {
   if (!stream) throw std::system_error(errno, std::generic_category(), file);
 }
 
-// A sending that failed before there was a transfer.
+// The result of a failure before the transfer began.
 TTransferred NotBegun(std::exception const& failure) {
   TTransferred transferred;
   transferred.fOutcome = {kZEPStatusFail, StatusOf(failure), failure.what()};

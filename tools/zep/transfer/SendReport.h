@@ -6,14 +6,14 @@
 
 namespace NQRVZEP20::zep {
 
-// A report that was sent, or was not.
+// The result of sending a report.
 struct TSentReport {
   TTransferred fTransferred;
-  std::string fKeptIn;  // the file with the report; empty when it was sent, or could not even be written
+  std::string fKeptIn;  // the file that holds the report after a failure; empty after a success, or if it could not be written
 };
 
-// Packs the report's document (ReportFileName and ".gz") and sends it; says on standard error what became of it. When it
-// cannot be sent, for whatever reason, the file is kept.
+// Compresses the report's JSON document into a file (ReportFileName with ".json.gz"), sends it, and prints the result to standard
+// error. If sending fails for any reason, the file is kept.
 TSentReport SendReport(TReport const& report, TTarget const& target, TTransferOptions const& options);
 
 // Why the exit status is not 0, for the document of the report.

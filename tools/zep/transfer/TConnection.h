@@ -26,10 +26,10 @@ struct TConnectionFunctions : TCurlFunctions {
   }
 };
 
-// libcurl, and one connection that successive transfers share. It belongs to one thread.
+// libcurl, and a connection that successive transfers share. Use it from one thread only.
 class TConnection {
 public:
-  // Throws TZEPFailure with kZEPStatusLibCurlFailure when libcurl cannot be used.
+  // Throws TZEPFailure with kZEPStatusLibCurlFailure if libcurl cannot be loaded or initialised.
   TConnection();
   ~TConnection();
   TConnection(TConnection const&) = delete;
@@ -40,26 +40,27 @@ public:
     fCurl->fSetOption(fHandle, option, value);
   }
 
-  // The commands that the server executes after the next transfers.
+  // Sets the commands that are sent to the server after each of the following transfers.
   void SetCommandsAfter(TCommands const& commands);
 
-  // Blocks until the transfer has ended.
+  // Performs a transfer and blocks until it has ended.
   CURLcode Perform(std::string const& url);
 
-  // When the remote file of the last transfer was changed last, in seconds since 1970; -1 when the server does not report it.
+  // The modification time of the last transfer's remote file, in seconds since 1970; -1 if the server does not report it.
   std::int64_t RemoteTime() const;
 
-  // The size of what the last transfer fetches, in bytes; -1 when the server does not report it. 0 also when it fetches nothing.
+  // The number of bytes that the last transfer downloads; -1 if the server does not report it. Also 0 for a transfer without a
+  // download.
   std::int64_t BytesToCome() const;
 
-  // Whether the connection of the last transfer has ended.
+  // Whether the connection of the last transfer has been closed.
   bool IsLost() const;
 
-  // Why the last transfer failed; may be empty. It is empty when no connection to the server could be made: WhyUnreachable finds
-  // that reason.
+  // Why the last transfer failed; may be empty. It is always empty if no connection to the server could be made; WhyUnreachable
+  // finds the reason for that.
   std::string ErrorText() const;
 
-  // Throws the TZEPFailure for a failed transfer.
+  // Throws the TZEPFailure that reports this result of a transfer.
   [[noreturn]] static void FailFor(CURLcode code, std::string const& errorText);
 
 private:

@@ -7,17 +7,17 @@
 
 namespace NQRVZEP20::zep {
 
-// A lock between processes: an empty file that one process at a time has locked. It is removed at the end. The lock file of a
-// process that was killed is used again. A file with content was not made by zep, and stays.
+// A lock between processes: an empty file that only one process at a time can lock (flock). The destructor removes the file. A
+// file left by a killed process is used again. A file that is not empty was not created by zep, and is never removed.
 class TLockFile {
 public:
-  // Does not wait for another process: WhyNotHeld then has the reason.
+  // Does not wait: if another process holds the lock, WhyNotHeld returns the reason.
   explicit TLockFile(std::string path);
   ~TLockFile();
   TLockFile(TLockFile const&) = delete;
   TLockFile& operator=(TLockFile const&) = delete;
 
-  // For the user; empty when this process holds the lock.
+  // Why this process does not hold the lock, for the user; empty if it does.
   std::string const& WhyNotHeld() const { return fWhyNotHeld; }
 
 private:

@@ -47,7 +47,7 @@ std::string ReasonOf(int error) { return std::generic_category().message(error);
 
 // ---- Progress ----
 
-// One line on the terminal of standard error, written over and over, and gone at the end.
+// A progress line on the terminal of standard error, which is redrawn repeatedly and erased at the end.
 class TProgress {
 public:
   TProgress(std::uint64_t total, bool isWanted) : fTotal(total), fIsShown(isWanted && CanRedrawErrors()) {}
@@ -67,7 +67,7 @@ public:
   }
 
 private:
-  // Whether the terminal takes a line at once. After Ctrl-S it takes none, and zep would not notice that a transfer has ended.
+  // Whether a write to the terminal does not block. After Ctrl-S it would, and zep would not notice the end of the transfer.
   static bool CanWrite() {
     pollfd errors{STDERR_FILENO, POLLOUT, 0};
     return ::poll(&errors, 1, 0) > 0;
@@ -81,7 +81,7 @@ private:
     return "[" + bar + "] " + std::to_string(share * 100 / fTotal) + " %";
   }
 
-  std::uint64_t fTotal;  // 0: not known
+  std::uint64_t fTotal;  // 0: unknown
   bool fIsShown;
   std::chrono::steady_clock::time_point fStart = std::chrono::steady_clock::now();
 };
@@ -97,12 +97,12 @@ TOutcome Transfer(std::function<TZEPStatusCode()> const& transfer, TTransferStat
   return RunWatched(transfer, watch);
 }
 
-// Adds why the connection failed, which the library does not report. A host that does not answer at all shows as a standstill in
-// which nothing moved.
+// Adds the reason for a failed connection, which the library does not report. If the host does not answer at all, the transfer
+// stalls before any byte is moved.
 void ExplainNoConnection(TOutcome& outcome, TRemote const& remote, bool isNothingMoved) {
   constexpr int kProbeSeconds = 3;
-  bool const isStandstill = outcome.fExit == kExitStalled && isNothingMoved;
-  if (outcome.fExit != kExitNoConnection && !isStandstill) return;
+  bool const isStall = outcome.fExit == kExitStalled && isNothingMoved;
+  if (outcome.fExit != kExitNoConnection && !isStall) return;
   std::string const usualPort = remote.fScheme == "sftp" ? "22" : "21";
   std::string const why = WhyUnreachable(remote.fHost, remote.fPort.empty() ? usualPort : remote.fPort, kProbeSeconds);
   if (PendingInterrupt() != 0)
@@ -123,7 +123,7 @@ TTransferred Failed(TTransferred transferred, EExitStatus exit, std::string cons
   return transferred;
 }
 
-// The transfer with its final outcome: the interrupt, if there is one.
+// The transfer with its final outcome, which is the interrupt if one is pending.
 TTransferred Decided(TTransferred transferred) {
   TOutcome const outcome = transferred.fOutcome;
   if (!IsInterruptedAtLast() || outcome.fExit >= kExitHangUp) return transferred;
@@ -134,7 +134,7 @@ TTransferred Decided(TTransferred transferred) {
   return Failed(transferred, StatusOfInterrupt(), reason);
 }
 
-// Fills in user and password. False, with the outcome, after an interrupt.
+// Fills in user and password. After an interrupt, sets the outcome and returns false.
 bool FindPasswordOf(TRemote& remote, TTransferred& transferred, TTransferOptions const& options) {
   try {
     FindPassword(remote, options.fNetrc);
@@ -146,7 +146,7 @@ bool FindPasswordOf(TRemote& remote, TTransferred& transferred, TTransferOptions
   }
 }
 
-// Reads "500K" into the bytes; returns why that cannot be, or an empty text.
+// Parses a size such as "500K". Returns an empty text, or the reason why it is not a size.
 std::string WhyNoSize(std::string const& text, std::uint64_t& bytes) {
   constexpr std::string_view kUnits = "KMGT";
   std::uint64_t number = 0;
@@ -164,7 +164,7 @@ bool IsSameFile(struct stat const& a, struct stat const& b) { return a.st_dev ==
 
 // ---- Sending ----
 
-// Why a file cannot be sent; empty when it can.
+// Why the file cannot be uploaded; empty if it can.
 std::string WhyNotReadable(std::string const& file, struct stat& status) {
   if (::stat(file.c_str(), &status) != 0) return ReasonOf(errno);
   if (!S_ISREG(status.st_mode)) return "it is not a regular file";
@@ -173,7 +173,7 @@ std::string WhyNotReadable(std::string const& file, struct stat& status) {
   return opened && ::pread(opened.get(), &first, 1, 0) >= 0 ? "" : ReasonOf(errno);
 }
 
-// Computes the checksum, which stays empty after an interrupt. Returns why it cannot, or an empty text.
+// Computes the checksum, which stays empty after an interrupt. Returns an empty text, or the reason for a failure.
 std::string WhyNoChecksum(std::string const& file, std::string& checksum) {
   try {
     checksum = Sha256Of(file);
@@ -193,27 +193,27 @@ void AddName(TRemote& remote, std::string const& name) {
   if (remote.fPath.empty() || remote.fPath.back() == '/') remote.fPath += EncodedName(name);
 }
 
-// Where the file arrives: on bootable media the library chooses the directory of a host.
+// The final path of an upload. On bootable media the library chooses the directory for a host alone.
 TRemote PlaceOf(TTarget const& target) {
   TRemote place = target.fRemote;
   if (target.fIsHost) place.fPath = RemotePathOf(place.fPath);
   return place;
 }
 
-// How long a server has to remove what a failed upload left. The usual time is shorter than a standstill.
+// The time limit for removing an incomplete upload. By default it is shorter than the longest stall allowed.
 int CleanUpSecondsOf(TTransferOptions const& options) {
   constexpr int kMost = 10;
   if (options.fCleanUpSeconds > 0) return options.fCleanUpSeconds;
   return options.fStallSeconds > 0 ? std::clamp(options.fStallSeconds / 2, 1, kMost) : kMost;
 }
 
-// How long the clean-up may take after zep has ended the process of the upload: the user is waiting.
+// The time limit after zep has killed the process of the upload. It is short by default, because the user is waiting.
 int CleanUpSecondsAfterEnd(TTransferOptions const& options) {
   constexpr int kMost = 5;
   return options.fCleanUpSeconds > 0 ? options.fCleanUpSeconds : std::min(CleanUpSecondsOf(options), kMost);
 }
 
-// Removes what an upload left whose process was ended. One more interrupt ends the wait.
+// Removes what an upload left whose process was killed. Another interrupt ends the wait.
 void CleanUp(TRemote const& place, TUploadNames const& names, int limit, TTransferState& state) {
   TChildProcess const child(
       [&] {
@@ -231,7 +231,7 @@ std::string JoinedByAnd(std::vector<std::string> const& texts) {
   return joined;
 }
 
-// What an upload that failed has done to the earlier file.
+// States what a failed upload has done to the earlier file.
 std::string LossText(EEarlierFile earlier) {
   switch (earlier) {
     case EEarlierFile::kIsLost:
@@ -243,7 +243,7 @@ std::string LossText(EEarlierFile earlier) {
   }
 }
 
-// Adds what is known of an upload besides its outcome: why its file could not be read, and what may be left on the server.
+// Adds details of an upload to its outcome: why the local file could not be read, and what may be left on the server.
 void ExplainUpload(TTransferred& transferred, TRemote const& place, TUploadNames const& names, TTransferState const& state) {
   TOutcome& outcome = transferred.fOutcome;
   bool const isComplete = outcome.fExit == kExitComplete;
@@ -264,7 +264,7 @@ void ExplainUpload(TTransferred& transferred, TRemote const& place, TUploadNames
   outcome.fReason += transferred.fFormerUrl;
 }
 
-// The transfer of a file that was sent, with its checksum. `before`: the file before the transfer.
+// Adds the checksum to a complete upload, which fails if the local file is no longer as it was `before`.
 TTransferred WithChecksum(TTransferred transferred, struct stat const& before) {
   std::string const file = transferred.fFile;
   bool const isAsBefore = IsAsBefore(file, before);
@@ -292,7 +292,7 @@ TTransferred BrokenOff(TTransferred transferred, bool wasThere, TTransferState c
   return transferred;
 }
 
-// Gives the part, which is complete, the name of the file. An interrupt before that leaves the part.
+// Renames the complete part to the final name. An interrupt before that leaves the part.
 TTransferred Completed(TTransferred transferred, std::string const& file, bool overwrites, TTransferState const& state) {
   std::string const& part = transferred.fFile;
   transferred.fBytes = state.fMoved;
@@ -315,21 +315,21 @@ TTransferred Completed(TTransferred transferred, std::string const& file, bool o
 }  // namespace
 
 void AddTransferOptions(CLI::App& command, TTransferOptions& options) {
-  command.add_flag("--quiet", options.fQuiet, "No progress, and no message after a success");
+  command.add_flag("--quiet", options.fQuiet, "Do not print the progress, or a message after a success");
   command
       .add_option("--stall", options.fStallSeconds,
-                  "The longest standstill allowed, in seconds (60); 0 waits for ever. What is sent counts as moved when\n"
-                  "it is read: the last few MiB must reach a slow server within that time")
+                  "The number of seconds without progress after which the transfer is ended (60); 0: never. In an upload,\n"
+                  "bytes count when they are read, so the last few MiB must reach the server within this time")
       ->check(CLI::Range(0, 86400));
-  command.add_option("--netrc", options.fNetrc, "The file with users and passwords ($NETRC, else ~/.netrc)");
+  command.add_option("--netrc", options.fNetrc, "The netrc file with users and passwords (default: $NETRC, or ~/.netrc)");
 }
 
 void AddUploadOptions(CLI::App& command, TTransferOptions& options) {
   AddTransferOptions(command, options);
   command
       .add_option("--clean-up", options.fCleanUpSeconds,
-                  "The longest time for removing an incomplete file from the server after a failure, in seconds (10;\n"
-                  "after a stall or an interrupt 5)")
+                  "The time limit, in seconds, for removing an incomplete file from the server after a failure (10; after\n"
+                  "a stall or an interrupt 5)")
       ->check(CLI::Range(1, 3600));
 }
 
@@ -344,11 +344,11 @@ void AddSizeOption(CLI::App& command, std::string const& name, std::uint64_t& by
 
 std::string TransferHelp() {
   return "Passwords come from the URL (which other users may see in the list of processes), from netrc, or from a prompt.\n"
-         "The key of an SFTP server is not checked: an impostor gets the password.\n"
-         "In the path of a URL blanks and the like may be written as they are; \"%20\" stays what it is.\n"
-         "Exit status: 0 when all went well, 1 when the server refused it or the transfer broke off, 64 for wrong usage,\n"
-         "66 when the file to be sent cannot be read, 68 when the host is unknown or nobody answers, 69 without libcurl,\n"
-         "73 when the local file exists or cannot be written, 75 when nothing moved for too long.";
+         "The host key of an SFTP server is not verified, so another server in its place would receive the password.\n"
+         "The path of a URL may contain spaces and other special characters; percent-escapes such as \"%20\" are decoded.\n"
+         "Exit status: 0 after a success, 1 when the server refused the transfer or it failed, 64 for wrong usage, 66 when the\n"
+         "file to send cannot be read, 68 when the host is unknown or cannot be reached, 69 when libcurl is missing, 73 when\n"
+         "the local file exists or cannot be written, 75 when the transfer made no progress for the seconds of --stall.";
 }
 
 bool IsUrl(std::string const& text) { return text.find("://") != text.npos; }
@@ -407,7 +407,7 @@ TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, T
 }
 
 void WarnOfLeft(TTransferred const& transferred) {
-  if (transferred.fOutcome.fExit != kExitComplete) return;  // the reason has it
+  if (transferred.fOutcome.fExit != kExitComplete) return;  // the reason already names them
   for (std::string const& url : transferred.fLeftOnServer) {
     bool const isFormer = url == transferred.fFormerUrl;
     std::cerr << "zep: warning: the server did not remove " << url

@@ -18,65 +18,65 @@ namespace NQRVZEP20::zep {
 
 constexpr std::uint64_t kUsualMostBytes = std::uint64_t{10} << 30;
 
-// What every command that transfers files can be told.
+// The options of every command that transfers files.
 struct TTransferOptions {
-  bool fQuiet = false;  // no progress, and no message after a success
+  bool fQuiet = false;  // suppresses the progress, and the message after a success
   int fStallSeconds = kUsualStallSeconds;
   std::string fNetrc;
-  std::uint64_t fMostBytes = kUsualMostBytes;  // of a file that is fetched; 0: any size
-  int fCleanUpSeconds = 0;                     // for removing what a failed upload left on the server; 0: the usual time
+  std::uint64_t fMostBytes = kUsualMostBytes;  // the size limit for a download; 0: no limit
+  int fCleanUpSeconds = 0;                     // the time limit for removing an incomplete upload; 0: the default
 };
 
 void AddTransferOptions(CLI::App& command, TTransferOptions& options);
 
-// The same, and those of commands that send.
+// Adds these and the options of commands that upload.
 void AddUploadOptions(CLI::App& command, TTransferOptions& options);
 
-// An option that takes a number of bytes, or one of KiB, MiB, GiB or TiB with "K", "M", "G" or "T" behind it.
+// Adds an option for a size in bytes, or in KiB, MiB, GiB or TiB with the suffix "K", "M", "G" or "T".
 void AddSizeOption(CLI::App& command, std::string const& name, std::uint64_t& bytes, std::string const& description);
 
-// The end of the help of such a command: passwords, and the exit status for each kind of failure.
+// The end of the help text of these commands: passwords, and the exit statuses.
 std::string TransferHelp();
 
-// A transfer that has ended.
+// The result of a transfer.
 struct TTransferred {
   TOutcome fOutcome;
-  std::string fUrl;  // for people
+  std::string fUrl;  // for messages: without the password
   std::string fFile;
   std::uint64_t fBytes = 0;
-  std::string fSha256;                     // of the local file; when all went well
+  std::string fSha256;                     // of the local file, after a success
   bool fHasArrived = false;                // of an upload that failed: its complete file is on the server
-  std::vector<std::string> fLeftOnServer;  // URLs for people: what an upload may have left there beside the file
-  std::string fFormerUrl;                  // the one of these that is the earlier file; empty when there is none
+  std::vector<std::string> fLeftOnServer;  // the URLs of files that an upload may have left on the server
+  std::string fFormerUrl;                  // the one that is the replaced file; empty if there is none
 };
 
-// Warns on standard error of what an upload that went well left on the server.
+// Warns on standard error of each file that a successful upload left on the server.
 void WarnOfLeft(TTransferred const& transferred);
 
-// Where a file is to be sent: a URL (which ends in "/" when the name is still to be added), or a host alone.
+// The target of an upload: a URL, or a host alone. The name of the file is added to a URL that ends in "/".
 struct TTarget {
   TRemote fRemote;
-  bool fIsHost;  // the library chooses the directory then
+  bool fIsHost;  // a host alone: the library chooses the directory
 };
 
 bool IsUrl(std::string const& text);
 
-// Of ftp and sftp only. Throws TWrongUsage.
+// Parses a target. Throws TWrongUsage, also for a scheme other than ftp and sftp.
 TTarget TargetOf(std::string const& text, bool bySftp);
 
-// Sends a file under that name ("": its own): under a temporary one at first, which it loses when all has arrived. A file that
-// changes meanwhile is sent in part.
+// Uploads a file under `name`, or under its own name if that is empty. Until the upload is complete, the file has a temporary
+// name on the server. If the file changes during the upload, the exit status is kExitPartial.
 TTransferred SendFile(std::string const& file, TTarget target, std::string const& name, TTransferOptions const& options);
 
-// Fetches what the URL names into the file, by way of the file with ".part" behind its name, which stays when the transfer
-// breaks off, and with which the next one goes on; one transfer at a time has it. `overwrites`: whether a file may be there.
+// Downloads a remote file. Until the download is complete, its bytes are in the part (PartFile.h), which is locked; a failed
+// download leaves it, and the next download resumes it. `overwrites`: whether an existing file is replaced.
 TTransferred GetFile(TRemote remote, std::string const& file, bool overwrites, TTransferOptions const& options);
 
-// What became of a transfer, as a document of that command.
+// The result as a JSON document of that command.
 TJson DocumentOf(TTransferred const& transferred, std::string const& command);
 
-// Says on standard output, or as one JSON document, what became of a transfer, and on standard error why it failed. Returns
-// its exit status.
+// Prints the result to standard output, as text or as a JSON document, and the reason for a failure to standard error. Returns
+// the exit status.
 int TellOf(TTransferred const& transferred, std::string const& command, bool asJson, TTransferOptions const& options);
 
 }  // namespace NQRVZEP20::zep

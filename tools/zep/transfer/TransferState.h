@@ -10,34 +10,35 @@
 
 namespace NQRVZEP20::zep {
 
-// Bits of TTransferState::fLeft. "Place" is where the upload is to arrive, and "earlier file" the one that was there before.
+// Bits of TTransferState::fLeft. The "place" is the final path of the upload, and the "earlier file" is the file that was there
+// before.
 enum ELeft : unsigned {
-  kLeftTemporary = 1,   // the file, or a part of it, under its temporary name
-  kLeftFormer = 2,      // the earlier file, under the name that it got to make way
-  kLeftAtPlace = 4,     // a part of the file at the place itself
-  kLeftPlaceEmpty = 8,  // the earlier file made way, and nothing has taken its place; not together with kLeftAtPlace
-  kMayBeRenamed = 16,   // the complete file may have lost its temporary name, and be at the place
+  kLeftTemporary = 1,   // the complete or incomplete file under its temporary name
+  kLeftFormer = 2,      // the earlier file, which was renamed to make way
+  kLeftAtPlace = 4,     // an incomplete file at the place
+  kLeftPlaceEmpty = 8,  // the earlier file made way, and no file is at the place; not together with kLeftAtPlace
+  kMayBeRenamed = 16,   // the complete file may have been renamed, and may be at the place
 };
 
-// What became of a file that an upload found at its place.
+// The fate of the earlier file.
 enum class EEarlierFile {
-  kIsThere,    // it was not touched, or a complete file replaced it
-  kMayBeLost,  // a part was written over it, if there was one
-  kIsLost,     // a part was written over it
+  kIsThere,    // it was not changed, or a complete file replaced it
+  kMayBeLost,  // if there was one, it was overwritten by an incomplete file
+  kIsLost,     // it was overwritten by an incomplete file
 };
 
-// The state of a transfer, which its process updates while it runs, in memory that it shares with zep.
+// The state of a transfer, in memory that zep shares with the process of the transfer, which updates it.
 struct TTransferState {
-  std::atomic<std::uint64_t> fMoved{0};       // bytes of the local file, read or written
+  std::atomic<std::uint64_t> fMoved{0};       // bytes of the local file that were read or written
   std::atomic<std::int64_t> fRemoteTime{-1};  // when the remote file that the part is of was changed last, in seconds since
                                               // 1970; -1: the server does not report it, or nothing was written
   std::atomic<dev_t> fDevice{0};              // of the part that a download wrote
   std::atomic<ino_t> fInode{0};               // of the same
-  std::atomic<int> fReadError{0};             // errno, when the file that is sent could not be read
-  std::atomic<unsigned> fLeft{0};             // ELeft: what of an upload may be left on the server
+  std::atomic<int> fReadError{0};             // errno, if the file to upload could not be read
+  std::atomic<unsigned> fLeft{0};             // ELeft: what an upload may have left on the server
   std::atomic<EEarlierFile> fEarlierFile{EEarlierFile::kIsThere};
-  std::atomic<bool> fIsTooLarge{false};   // of a download
-  std::atomic<bool> fIsFinishing{false};  // nothing moves: a download is written to the disk, or an upload is cleaned up
+  std::atomic<bool> fIsTooLarge{false};   // the file to download exceeds the size limit
+  std::atomic<bool> fIsFinishing{false};  // no bytes move: a download is flushed to disk, or an upload is cleaned up
 };
 
 class TSharedTransferState {

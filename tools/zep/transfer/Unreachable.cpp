@@ -29,7 +29,7 @@ std::string WithoutBrackets(std::string const& host) {
   return isBracketed ? host.substr(1, host.size() - 2) : host;
 }
 
-// Returns 0 or the error of getaddrinfo.
+// Returns 0 or an error of getaddrinfo.
 int Resolve(std::string const& host, std::string const& port, TAddresses& addresses) {
   addrinfo wanted{}, *found = nullptr;
   wanted.ai_socktype = SOCK_STREAM;
@@ -38,7 +38,7 @@ int Resolve(std::string const& host, std::string const& port, TAddresses& addres
   return error;
 }
 
-// Waits until connecting has ended. Returns 0 or ETIMEDOUT. No signal shortens the wait.
+// Waits until the connection attempt has ended. Returns 0, ETIMEDOUT or another errno. A signal does not shorten the wait.
 int WaitForConnection(int socket, int timeoutSeconds) {
   using TClock = std::chrono::steady_clock;
   TClock::time_point const end = TClock::now() + std::chrono::seconds(timeoutSeconds);
@@ -52,7 +52,7 @@ int WaitForConnection(int socket, int timeoutSeconds) {
   }
 }
 
-// The errno of connecting; 0 when it succeeds.
+// Tries to connect. Returns 0 or errno.
 int ErrorOfConnecting(addrinfo const& address, int timeoutSeconds) {
   TUniqueFd const socket(::socket(address.ai_family, SOCK_STREAM | SOCK_NONBLOCK | SOCK_CLOEXEC, 0));
   if (!socket) return errno;
@@ -87,7 +87,7 @@ std::string ResultOfProbe(std::string const& host, std::string const& port, int 
 
 }  // namespace
 
-// In a process of its own, which an interrupt ends: the look-up of a name goes on after a signal.
+// Uses a child process, which can be killed: a name look-up continues after a signal.
 std::string WhyUnreachable(std::string const& host, std::string const& port, int timeoutSeconds) {
   constexpr int kLookEveryMilliseconds = 100;
   TChildProcess child([&] { return ResultOfProbe(host, port, timeoutSeconds); }, SIGKILL);

@@ -5,9 +5,9 @@
 
 namespace NQRVZEP20::zep {
 
-// Why no connection to that TCP port can be made: the host name has no address, or each of its addresses refuses or does not
-// answer within `timeoutSeconds`. Tries it, and so blocks; empty when it succeeds. A remedy is named.
-// An interrupt (Interrupts.h) ends the wait, and is then the reason: "interrupted".
+// Tries to connect to a TCP port, and returns why that fails, with a remedy: the host name has no address, or each of its
+// addresses refuses the connection or does not answer within `timeoutSeconds`. Returns an empty text if it succeeds. Blocks; an
+// interrupt (Interrupts.h) ends the wait, and the result is then "interrupted".
 std::string WhyUnreachable(std::string const& host, std::string const& port, int timeoutSeconds);
 
 }  // namespace NQRVZEP20::zep

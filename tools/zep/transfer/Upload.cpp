@@ -26,10 +26,11 @@ struct TSource {
   TUniqueFd fFile;
   TTransferState& fState;
   unsigned fMark;         // of fState.fLeft
-  EEarlierFile fEarlier;  // of fState.fEarlierFile, once the server has begun to write
+  EEarlierFile fEarlier;  // the value for fState.fEarlierFile once the server may have begun to write
 };
 
-// libcurl's callback before a transfer whose connection is there. A libcurl before 7.80 has none; ReadSource has to do.
+// libcurl's callback before a transfer, after the connection is made. libcurl before 7.80 does not call it; then only ReadSource
+// sets the mark.
 int MarkBegun(void* context, char*, char*, int, int) {
   TSource& source = *static_cast<TSource*>(context);
   source.fState.fLeft |= source.fMark;
@@ -61,9 +62,9 @@ bool HasControlCharacter(std::string const& text) {
   return false;
 }
 
-// A name that no other transfer has.
+// A random name, which no other transfer uses.
 std::string TemporaryNameFor(std::string const& name) {
-  constexpr std::size_t kLongest = 200;  // names of 255 bytes are common, and the rest needs some
+  constexpr std::size_t kLongest = 200;  // many file systems allow 255 bytes, including the suffix
   char number[16];
   std::snprintf(number, sizeof number, ".%08x", static_cast<unsigned>(std::random_device()()));
   return name.substr(0, kLongest) + number + ".part";
@@ -78,7 +79,7 @@ std::string QuotedForSftp(std::string const& path) {
   return quoted + "\"";
 }
 
-// libcurl's write callback for a text; one of more than 16 MiB is given up.
+// libcurl's write callback that collects a text. The transfer fails if it exceeds 16 MiB.
 std::size_t AppendText(char const* bytes, std::size_t size, std::size_t count, void* context) {
   constexpr std::size_t kMostBytes = 16 << 20;
   std::string& text = *static_cast<std::string*>(context);
@@ -88,10 +89,10 @@ std::size_t AppendText(char const* bytes, std::size_t size, std::size_t count, v
   return length;
 }
 
-// libcurl's write callback for a transfer that ends with the first bytes that arrive.
+// libcurl's write callback that ends the transfer when the first bytes arrive.
 std::size_t EndTransfer(char const*, std::size_t size, std::size_t count, void*) { return size * count + 1; }
 
-// A place on the server, and the names beside it, as the server's commands have them.
+// The place of an upload, and other names in its directory, in the form that the commands of the server need.
 class TNames {
 public:
   explicit TNames(TRemote const& place) : fPlace(place), fName(Decoded(NameIn(place.fPath))), fDirectory(place) {
@@ -109,7 +110,7 @@ public:
     return {"RNFR " + from, "RNTO " + to};
   }
   TCommands Removal(std::string const& name) const { return {IsSftp() ? "rm " + SftpPath(name) : "DELE " + name}; }
-  // Of SFTP only. A refusal does not count.
+  // For SFTP only. A refusal is ignored.
   std::string ChangeOfMode(std::string const& name, int mode) const {
     char octal[16];
     std::snprintf(octal, sizeof octal, "%03o", static_cast<unsigned>(mode));
@@ -118,7 +119,7 @@ public:
   bool IsSftp() const { return fPlace.fScheme == "sftp"; }
 
 private:
-  // FTP commands are about the directory that libcurl has changed to; SFTP's need the path.
+  // FTP commands apply to the directory into which libcurl has changed; SFTP commands need the path.
   std::string SftpPath(std::string const& name) const {
     std::string const path = "/" + Decoded(fDirectory.fPath) + name;
     return QuotedForSftp(path.rfind("/~/", 0) == 0 ? path.substr(3) : path);
@@ -129,12 +130,12 @@ private:
   TRemote fDirectory;
 };
 
-// What the server shows of the thing at a place.
+// What exists at the place, according to the server.
 struct TAtPlace {
   enum EKind { kUnknown, kFile, kDirectory, kOther };
   EKind fKind = kUnknown;
-  int fMode = -1;                // of a file; -1 when the server does not report it
-  CURLcode fFailure = CURLE_OK;  // of a lost connection or the like; the kind is unknown then
+  int fMode = -1;                // of a file; -1 if the server does not report it
+  CURLcode fFailure = CURLE_OK;  // not CURLE_OK if there was no answer, as after a lost connection; the kind is then unknown
 };
 
 class TUpload {
@@ -156,8 +157,8 @@ public:
     SendToThePlace();
   }
 
-  // A file at the place is spared when no byte of this upload has been sent to it: it may be the earlier one. The earlier file
-  // gets its name back when it made way and the upload did not take its place.
+  // A file at the place is not removed if no byte of this upload has been sent to it, because it may be the earlier file. If the
+  // earlier file made way and the new file is not at the place, the earlier file gets its name back.
   void RemoveParts() {
     StartCleanUp();
     bool const isNotComplete = fState.fLeft & (kLeftTemporary | kLeftAtPlace | kLeftPlaceEmpty);
@@ -167,8 +168,8 @@ public:
   }
 
 private:
-  // Whether the server refused the transfer. libcurl gives the same codes for an SFTP connection that was lost: the server may
-  // then have done what it did not answer.
+  // Whether the server refused the transfer. libcurl returns the same codes for a lost SFTP connection, after which the server
+  // may have executed a command without answering it.
   bool IsRefusal(CURLcode code) const {
     bool const isCode = code == CURLE_UPLOAD_FAILED || code == CURLE_REMOTE_ACCESS_DENIED || code == CURLE_REMOTE_FILE_EXISTS ||
                         code == CURLE_REMOTE_FILE_NOT_FOUND || code == CURLE_SSH || code == CURLE_QUOTE_ERROR;
@@ -184,7 +185,8 @@ private:
       fState.fLeft &= ~what;
   }
 
-  // Once the server may have begun to write, `mark` is set in fLeft; once it has, `earlier` in fEarlierFile.
+  // Sets `mark` in fLeft as soon as the server may have created the file, and fEarlierFile to `earlier` as soon as it may have
+  // written to it.
   CURLcode Send(std::string const& url, TCommands const& commandsAfter, ELeft mark, EEarlierFile earlier) {
     TSource source{TUniqueFd(::open(fFile.c_str(), O_RDONLY | O_CLOEXEC)), fState, mark, earlier};
     if (!source.fFile) {
@@ -199,24 +201,24 @@ private:
     fConnection.Set(CURLOPT_PREREQDATA, &source);
     fConnection.SetCommandsAfter(commandsAfter);
     CURLcode const code = fConnection.Perform(url);
-    if (code == CURLE_COULDNT_CONNECT) SetLeft(mark, false);  // the server is told of the file after the data connection is made
+    if (code == CURLE_COULDNT_CONNECT) SetLeft(mark, false);  // without a data connection no file is created
     return code;
   }
 
   // ---- Commands ----
 
-  // From now on the commands, taken together, have fCleanUpSeconds.
+  // From now on all commands together may take fCleanUpSeconds.
   void StartCleanUp() {
     fIsCleanUp = true;
     fState.fIsFinishing = true;
     fCleanUpEnd = TClock::now() + std::chrono::seconds(fCleanUpSeconds);
   }
 
-  // The whole seconds that a command of the clean-up may take.
+  // The time left for the clean-up in seconds, rounded up.
   long SecondsLeft() const { return std::chrono::ceil<std::chrono::seconds>(fCleanUpEnd - TClock::now()).count(); }
 
-  // Sets the connection up for a short transfer that is not an upload. While the upload is cleaned up, a silent server gets half
-  // of the time for the command, and the other half for QUIT, which libcurl then sends and waits for.
+  // Prepares the connection for a short transfer that is not an upload. During the clean-up, half of the time left is for the
+  // answer to the command, and the other half for the answer to QUIT, which libcurl sends afterwards.
   void Prepare(bool hasBody, TCommands const& commandsAfter) {
     fConnection.Set(CURLOPT_UPLOAD, 0L);
     fConnection.Set(CURLOPT_NOBODY, hasBody ? 0L : 1L);
@@ -243,7 +245,7 @@ private:
     SetLeft(kLeftPlaceEmpty, false);
   }
 
-  // ---- The thing at the place ----
+  // ---- What exists at the place ----
 
   TAtPlace LookAtPlace() { return fNames.IsSftp() ? LookBySftp() : LookByFtp(); }
 
@@ -257,12 +259,12 @@ private:
     return code == CURLE_WRITE_ERROR ? CURLE_OK : code;
   }
 
-  // Servers report the size of a regular file only (SIZE).
+  // Servers report the size (SIZE) of regular files only.
   TAtPlace LookByFtp() {
     CURLcode const entered = Enter();
     if (entered == CURLE_OK) return {TAtPlace::kDirectory};
     if (entered != CURLE_REMOTE_ACCESS_DENIED) return {TAtPlace::kUnknown, -1, entered};
-    std::string headers;  // in which libcurl repeats the size
+    std::string headers;  // libcurl writes the size as a header
     Prepare(false, {});
     fConnection.Set(CURLOPT_WRITEFUNCTION, &AppendText);
     fConnection.Set(CURLOPT_WRITEDATA, &headers);
@@ -272,7 +274,7 @@ private:
     return {TAtPlace::kUnknown, -1, isAnswered ? CURLE_OK : sized};
   }
 
-  // A name with a line feed can forge a line of the listing. Therefore a directory is looked for first.
+  // A file name with a line feed can forge a line of the listing. Therefore the place is first opened as a directory.
   TAtPlace LookBySftp() {
     CURLcode const entered = Enter();
     if (entered == CURLE_OK) return {TAtPlace::kDirectory};
@@ -288,7 +290,7 @@ private:
     return LookByOpening(entry.fType == 'l');
   }
 
-  // Of SFTP: for a link, which is replaced when it leads to a file or nowhere, and for an entry that the server does not list.
+  // For SFTP: checks a link, which is replaced if its target is a file or missing, or an entry that the server does not list.
   TAtPlace LookByOpening(bool isLink) {
     Prepare(true, {});
     fConnection.Set(CURLOPT_WRITEFUNCTION, &EndTransfer);
@@ -299,7 +301,7 @@ private:
     return {TAtPlace::kUnknown, -1, IsRefusal(read) ? CURLE_OK : read};
   }
 
-  // The listing of the directory that the place is in, by SFTP.
+  // Fetches the listing of the directory of the place by SFTP.
   CURLcode List(std::string& listing) {
     Prepare(true, {});
     fConnection.Set(CURLOPT_WRITEFUNCTION, &AppendText);
@@ -307,9 +309,9 @@ private:
     return fConnection.Perform(fNames.DirectoryUrl());
   }
 
-  // ---- An upload that did not get its name ----
+  // ---- After a renaming that the server refused ----
 
-  // The file has arrived, but did not get its name. Some servers do not rename onto another file.
+  // The file has arrived, but the server refused to rename it. Some servers do not rename onto an existing file.
   void ReplaceOrSendAnew() {
     SetLeft(kMayBeRenamed, false);
     TAtPlace const found = LookAtPlace();
@@ -324,7 +326,7 @@ private:
     SendToThePlace();
   }
 
-  // Moves the file at the place out of the way, and the new one to the place. False when the server refuses one of them.
+  // Renames the file at the place to make way, and the new file to the place. Returns false if the server refuses one of the two.
   bool Replace(int mode) {
     std::string const &name = fNames.Name(), &temporary = fOthers.fTemporary, &former = fOthers.fFormer;
     SetLeft(kLeftFormer, true);
@@ -348,14 +350,14 @@ private:
     return true;
   }
 
-  // Whether the server executed the commands; false when it refused one. Fails when the connection was lost.
+  // Returns true if the server executed the commands, false if it refused one. Throws if the connection was lost.
   bool IsDone(CURLcode code) {
     bool const isRefused = code == CURLE_QUOTE_ERROR && IsRefusal(code);
     if (code != CURLE_OK && !isRefused) GiveUp(code, Reason(code));
     return code == CURLE_OK;
   }
 
-  // Why a transfer failed. libcurl's text for a lost SFTP connection names another cause.
+  // Why a transfer failed. libcurl's text for a lost SFTP connection is misleading.
   std::string Reason(CURLcode code) const {
     bool const isLost = code == CURLE_QUOTE_ERROR && !IsRefusal(code);
     return isLost ? "the connection was lost before the server answered" : fConnection.ErrorText();
@@ -375,7 +377,7 @@ private:
     if (fState.fLeft & kLeftFormer) Remove(fOthers.fFormer, kLeftFormer);
   }
 
-  // What becomes of the file at the place when the server writes to it. A file that made way is not at the place.
+  // What happens to the earlier file when the server writes to the place. A file that made way is no longer there.
   EEarlierFile EarlierFileWhenWritten() const {
     if (fState.fLeft & kLeftFormer) return EEarlierFile::kIsThere;
     return fIsFileAtPlace ? EEarlierFile::kIsLost : EEarlierFile::kMayBeLost;
@@ -383,7 +385,7 @@ private:
 
   // ---- Failures ----
 
-  // Removes what may have arrived, and fails.
+  // Removes what may have arrived, and throws.
   [[noreturn]] void GiveUp(CURLcode code, std::string const& reason) {
     RemoveParts();
     TConnection::FailFor(code, reason);
@@ -402,9 +404,9 @@ private:
   std::string const fFile;
   int const fCleanUpSeconds;
   bool fIsCleanUp = false;
-  TClock::time_point fCleanUpEnd;  // no command of the clean-up begins after it
-  bool fIsPlaceUnknown = false;    // a thing at the place may be a file or a directory
-  bool fIsFileAtPlace = false;     // the server has proved that
+  TClock::time_point fCleanUpEnd;  // no command of the clean-up is sent after this time
+  bool fIsPlaceUnknown = false;    // the place may have a file or a directory
+  bool fIsFileAtPlace = false;     // the server has proved that a file is at the place
   TTransferState& fState;
 };
 

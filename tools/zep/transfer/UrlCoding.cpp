@@ -22,7 +22,7 @@ bool IsUnreserved(char c) {
 std::string Encoded(std::string_view text, std::string_view others) {
   constexpr char const* kDigits = "0123456789ABCDEF";
   std::string encoded;
-  encoded.reserve(3 * text.size());  // a secret leaves no piece elsewhere
+  encoded.reserve(3 * text.size());  // a reallocation would leave a piece of a secret in freed memory
   for (char const c : text) {
     if (IsUnreserved(c) || others.find(c) != others.npos) {
       encoded += c;

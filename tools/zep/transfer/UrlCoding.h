@@ -6,15 +6,16 @@
 
 namespace NQRVZEP20::zep {
 
-// Letters, digits, "-", ".", "_" and "~".
+// Whether the character needs no escape in a URL: a letter, a digit, "-", ".", "_" or "~".
 bool IsUnreserved(char c);
 
-// Every character but the unreserved ones of a URL and those of `others` as "%2F".
+// Percent-encodes every character ("%2F") except the unreserved ones and those in `others`.
 std::string Encoded(std::string_view text, std::string_view others);
 
-// The same, but "%2F" in the text stays as it is.
+// Percent-encodes a path. Existing escapes ("%2F") are kept.
 std::string EncodedPath(std::string_view text);
 
+// Replaces each escape by the character that it stands for.
 std::string Decoded(std::string_view text);
 
 }  // namespace NQRVZEP20::zep

@@ -41,7 +41,7 @@ std::string ReportText(TZEPStatusCode const& status, std::string const& reason) 
   return std::to_string(status.GetCode()) + " " + reason;
 }
 
-// The report of the child: the status as a number, a blank, and the reason, which is empty when the failure carries none.
+// The report of the child: the status as a number, a space, and the reason, which may be empty.
 std::string ReportOf(std::function<TZEPStatusCode()> const& transfer) {
   try {
     return ReportText(transfer(), "");
@@ -54,7 +54,7 @@ std::string ReportOf(std::function<TZEPStatusCode()> const& transfer) {
   }
 }
 
-// Writing more than that to a file fails.
+// Lets every write fail that would make a file larger than that.
 void LimitFiles(std::uint64_t most) {
   rlimit const limit{most, most};
   ::signal(SIGXFSZ, SIG_IGN);
@@ -78,7 +78,7 @@ std::uint64_t BytesMoved(TWatch const& watch) {
   return absent ? 0 : size;
 }
 
-// When libcurl itself is missing, and not only one of its functions, the package to install.
+// Names the package to install if libcurl itself is missing, and not only one of its functions.
 std::string RemedyFor(std::string const& reason) {
   bool const isMissing = reason.find("Error opening curl library: ") != reason.npos;
   return isMissing ? "; install the package libcurl4" : "";
@@ -100,10 +100,10 @@ TOutcome OutcomeOf(std::string const& report) {
 }
 
 TOutcome Stalled(TWatch const& watch) {
-  return {kZEPStatusTransferFailure, kExitStalled, "nothing moved for " + std::to_string(watch.fStallSeconds) + " s"};
+  return {kZEPStatusTransferFailure, kExitStalled, "no progress for " + std::to_string(watch.fStallSeconds) + " s"};
 }
 
-// Reads the report until the child is done; false when it stood still for too long, or when zep is interrupted.
+// Reads the report until the child has ended. Returns false if the transfer stalls or an interrupt is pending.
 bool ReadReport(TChildProcess& child, TWatch const& watch, std::string& report) {
   std::uint64_t last = BytesMoved(watch);
   TClock::time_point lastMoved = TClock::now();
@@ -128,11 +128,11 @@ bool ReadReport(TChildProcess& child, TWatch const& watch, std::string& report) 
 TOutcome Interrupted() { return {kZEPStatusFail, StatusOfInterrupt(), "interrupted"}; }
 
 TOutcome RunWatched(std::function<TZEPStatusCode()> const& transfer, TWatch const& watch) {
-  TChildProcess child([&] { return ReportOfSilent(transfer, watch.fMostBytes); }, SIGKILL);  // a transfer does not outlive zep
+  TChildProcess child([&] { return ReportOfSilent(transfer, watch.fMostBytes); }, SIGKILL);  // it does not outlive zep
   std::string report;
   if (!ReadReport(child, watch, report)) return PendingInterrupt() != 0 ? Interrupted() : Stalled(watch);
   bool const isWhole = child.End();
-  if (!isWhole && PendingInterrupt() != 0) return Interrupted();  // which may have ended the process as well
+  if (!isWhole && PendingInterrupt() != 0) return Interrupted();  // the signal may have ended the child, too
   return OutcomeOf(report);
 }
 

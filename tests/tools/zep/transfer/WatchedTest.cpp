@@ -93,7 +93,7 @@ TEST(RunWatchedTest, MovementIsSeen) {
     if (!isFile) watch.fMoved = &state->fMoved;
     watch.fStallSeconds = 2;
     watch.fShowProgress = [&seen](std::uint64_t bytes) { seen = bytes; };
-    // Six steps of half a second: longer than the standstill that is allowed.
+    // Six steps of half a second: longer than the stall that is allowed.
     TOutcome const outcome = RunWatched(
         [&] {
           int const file = ::open(watch.fFile.c_str(), O_WRONLY | O_APPEND);
@@ -160,7 +160,7 @@ TEST(RunWatchedTest, AStandstillEndsTheTransfer) {
       },
       watch);
   EXPECT_EQ(outcome.fExit, kExitStalled);
-  EXPECT_EQ(outcome.fReason, "nothing moved for 1 s");
+  EXPECT_EQ(outcome.fReason, "no progress for 1 s");
   EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(30));
   EXPECT_EQ(::waitpid(-1, nullptr, WNOHANG), -1) << "no child is left";
 }
