@@ -542,6 +542,26 @@ TEST_F(ZepTransferTest, AnInterruptDuringTheChecksumEndsBothDocumentAndProcess) 
   EXPECT_EQ(Zep("get --force " + Url("f") + " " + back).fExitCode, kComplete);
 }
 
+// The relay withholds QUIT, with which the upload closes its connection.
+TEST_F(ZepTransferTest, AnInterruptAfterTheArrivalReportsWhereTheFileIs) {
+  fs::create_directory(fDir.Path("tmp"));
+  std::string const held = fDir.Path("held");
+  std::string const reason = "the complete file is on the server; zep was interrupted before it could report the checksum";
+  TServer const relay("relay.py", {"--ftp", "--hold", "0", "QUIT", "--held", held, "0", fServer->Port(), "1000000"});
+  std::string const url = fServer->UrlAt(relay.Port(), "");
+  for (std::string const& command : {"send --json " + Local("f", "text") + " " + url, "report --sample --json --send " + url}) {
+    SCOPED_TRACE(command);
+    fs::remove(held);
+    TInterrupted const run = InterruptedZep(
+        command, fDir, [&] { return fs::exists(held); }, SIGTERM);
+    EXPECT_EQ(run.fSignal, SIGTERM);
+    EXPECT_THAT(run.fOutput, AllOf(HasSubstr(": " + reason + "\n"), HasSubstr("\"reason\": \"" + reason + "\"")));
+    EXPECT_EQ(CountOf("a copy of the report is kept in ", run.fOutput), command.rfind("report", 0) == 0 ? 1u : 0u);
+  }
+  EXPECT_EQ(ReadFile(Remote("f")), "text");
+  EXPECT_EQ(NamesIn(fServer->Tree().Path()).size(), 2u);
+}
+
 TEST_F(ZepTransferTest, AnInterruptEndsTheWaitForANetrcThatIsAPipe) {
   fs::create_directory(fDir.Path("tmp"));
   std::string const pipe = fDir.Path("netrc");

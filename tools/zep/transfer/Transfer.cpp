@@ -377,6 +377,7 @@ TTransferred SendFile(std::string const& file, TTarget target, std::string const
   TUploadNames const names = NamesForUpload(place);
   transferred.fOutcome =
       Transfer([&] { return Upload(place, names, file, cleanUpSeconds, *state); }, *state, transferred.fBytes, options);
+  if (state->fHasArrived) transferred.fOutcome = {kZEPStatusOK, kExitComplete, ""};  // even if closing the connection failed
   EExitStatus const exit = transferred.fOutcome.fExit;
   bool const wasEnded = exit == kExitStalled || exit >= kExitHangUp;
   if (wasEnded && (state->fLeft & (kLeftTemporary | kLeftAtPlace | kLeftPlaceEmpty)))

@@ -36,6 +36,7 @@ struct TTransferState {
   std::atomic<ino_t> fInode{0};               // of the same
   std::atomic<int> fReadError{0};             // errno, if the file to upload could not be read
   std::atomic<unsigned> fLeft{0};             // ELeft: what an upload may have left on the server
+  std::atomic<bool> fHasArrived{false};       // the complete upload is at its place; only the connection is still open
   std::atomic<EEarlierFile> fEarlierFile{EEarlierFile::kIsThere};
   std::atomic<bool> fIsTooLarge{false};   // the file to download exceeds the size limit
   std::atomic<bool> fIsFinishing{false};  // no bytes move: a download is flushed to disk, or an upload is cleaned up

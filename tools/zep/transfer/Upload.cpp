@@ -425,7 +425,9 @@ TRemote Beside(TRemote const& place, std::string const& name) {
 
 TZEPStatusCode Upload(TRemote const& place, TUploadNames const& names, std::string const& file, int cleanUpSeconds,
                       TTransferState& state) {
-  TUpload(place, names, file, cleanUpSeconds, state).Run();
+  TUpload upload(place, names, file, cleanUpSeconds, state);
+  upload.Run();
+  state.fHasArrived = true;
   return kZEPStatusOK;
 }
 
