@@ -2,13 +2,14 @@
 #include "collect/PlugIns.h"
 
 #include "INamespaceProvider.h"
-#include "TOSSpecific.h"
 #include "TRootObject.h"
 #include "collect/process/EStage.h"
 #include "collect/process/TimedFailure.h"
 
+#include <cxxabi.h>
+
 #include <algorithm>
-#include <filesystem>
+#include <cstdlib>
 #include <map>
 #include <stdexcept>
 
@@ -40,10 +41,10 @@ TProviderRun Fill(std::string const& name, boost::shared_ptr<INamespaceProvider>
   return run;
 }
 
-TPlugIn Load(std::string const& name, std::string const& sampleLabel) {
-  TPlugIn plugIn{name, PlugInFile(name), 0, "", {}};
+TPlugIn Load(TPlugInFile const& file, std::string const& sampleLabel) {
+  TPlugIn plugIn{file.fName, file.fFile, 0, "", {}};
   TProviders const before = RegisteredProviders();
-  TTimedFailure const failure = TimedFailureOf([&] { TOSSpecific::LoadNSPLibrary(name); });
+  TTimedFailure const failure = TimedFailureOf([&] { LoadLibraryOf(file); });
   plugIn.fMilliseconds = failure.fMilliseconds;
   plugIn.fError = failure.ReasonOrMessage();
   if (!plugIn.fError.empty()) plugIn.fStage = NameOf(EStage::kOpen);
@@ -53,11 +54,24 @@ TPlugIn Load(std::string const& name, std::string const& sampleLabel) {
   return plugIn;
 }
 
+// The text with each mangled name of C++ in it, as the dynamic linker writes it, replaced by the name in the source.
+std::string Demangled(std::string const& text) {
+  std::string const characters = "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789_";
+  std::size_t const start = text.find("_Z");
+  if (start == text.npos) return text;
+  std::size_t const end = std::min(text.find_first_not_of(characters, start), text.size());
+  int status = 0;
+  std::unique_ptr<char, void (*)(void*)> const name(
+      abi::__cxa_demangle(text.substr(start, end - start).c_str(), nullptr, nullptr, &status), std::free);
+  std::string const rest = Demangled(text.substr(end));
+  return text.substr(0, start) + (name ? name.get() : text.substr(start, end - start)) + rest;
+}
+
 // "kZEPStatusAccessDenied (fill, libTest.nsp.so); last log line: [Error] no disk". A line that repeats the error is left out.
 std::string Phrase(std::string const& file, std::string const& error, std::string const& stage, std::string const& lastLogLine) {
   std::string const place = (stage.empty() ? "" : stage + ", ") + file.substr(file.rfind('/') + 1);
   bool const isNew = !lastLogLine.empty() && lastLogLine.find(error) == lastLogLine.npos;
-  return error + " (" + place + ")" + (isNew ? "; last log line: " + lastLogLine : "");
+  return Demangled(error) + " (" + place + ")" + (isNew ? "; last log line: " + lastLogLine : "");
 }
 
 }  // namespace
@@ -67,12 +81,19 @@ bool TPlugIn::HasFailed() const {
          std::any_of(fProviders.begin(), fProviders.end(), [](TProviderRun const& run) { return !run.fError.empty(); });
 }
 
-std::vector<TPlugIn> LoadPlugIns(std::optional<TSample> const& sample) {
+std::vector<TPlugIn> LoadPlugIns(std::vector<TPlugInFile> const& files, std::optional<TSample> const& sample) {
   if (sample) SetForProviders(*sample);
   std::vector<TPlugIn> plugIns;
-  for (std::string const& name : PlugInNames()) plugIns.push_back(Load(name, sample ? sample->fLabel : ""));
+  for (TPlugInFile const& file : files) {
+    if (file.IsLoaded()) plugIns.push_back(Load(file, sample ? sample->fLabel : ""));
+    if (!file.IsLoaded() && file.fIsMeant) plugIns.push_back(PassedOver(file));
+  }
   return plugIns;
 }
+
+std::vector<TPlugIn> LoadPlugIns(std::optional<TSample> const& sample) { return LoadPlugIns(FindPlugIns(), sample); }
+
+TPlugIn PassedOver(TPlugInFile const& file) { return {file.fName, file.fFile, 0, file.fReason, {}, NameOf(EStage::kOpen)}; }
 
 std::vector<TNamespaceView> ViewsOf(std::vector<TPlugIn> const& plugIns) {
   std::vector<TNamespaceView> views;
@@ -99,17 +120,5 @@ std::string FailurePhraseOf(TPlugIn const& plugIn) {
 std::string FailurePhraseOf(TPlugIn const& plugIn, TProviderRun const& run) {
   return Phrase(plugIn.fFile, run.fError, run.fStage, run.fLastLogLine);
 }
-
-std::vector<std::string> PlugInNames() {
-  std::vector<std::string> names = TOSSpecific::FindNSPs();
-  std::sort(names.begin(), names.end());
-  return names;
-}
-
-std::string PlugInFile(std::string const& name) {
-  return PlugInDirectory() + TOSSpecific::kFileSeparator + "lib" + name + kNSPExtension;
-}
-
-std::string PlugInDirectory() { return std::filesystem::path(TOSSpecific::GetZEPRootPath()).lexically_normal().string(); }
 
 }  // namespace NQRVZEP20

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "collect/PlugInFiles.h"
 #include "collect/Sample.h"
 #include "collect/TNamespaceView.h"
 
@@ -21,7 +22,7 @@ struct TProviderRun {
   std::string fLastLogLine = {};                // the last before the failure: "[Error] no disk"; empty if unknown
 };
 
-// One provider plug-in: a library lib*.nsp.so in the directory of libzepcore.so.
+// One provider plug-in: a library lib*.nsp.so in the directory of libzepcore.so, or one that is tried from elsewhere.
 struct TPlugIn {
   std::string fName;     // "Host" for libHost.nsp.so
   std::string fFile;     // its path
@@ -35,16 +36,20 @@ struct TPlugIn {
   bool HasFailed() const;  // the plug-in itself or one of its providers
 };
 
-// Finds the provider plug-ins, loads each into this process, and calls its providers to fill their namespaces, in the order of
-// the plug-in names. With a sample, providers read the sample instead of this machine's tables (Sample.h).
+// Loads these provider plug-ins into this process, in this order, and calls the providers of each to fill their namespaces. With
+// a sample, providers read the sample instead of this machine's tables (Sample.h). A file that is passed over is not in the
+// result, unless it was meant to be a plug-in (PlugInFiles.h): then it has failed.
 //
 // A plug-in that fails is returned with its error and does not affect the others. But a plug-in that crashes, hangs or exits
-// takes this process with it; LoadPlugInsApart (PlugInsApart.h) runs each plug-in in a separate process. Throws TZEPException
-// only if the plug-in directory cannot be read. Blocks until every provider has filled its namespace.
+// takes this process with it; LoadPlugInsApart (PlugInsApart.h) runs each plug-in in a separate process. Blocks until every
+// provider has filled its namespace.
 //
 // Call it once per process, before other threads are started: plug-ins stay loaded and registered, so a second call finds no
 // new providers. Plug-ins may print to standard output; a front end that writes a document there should redirect it during this
 // call.
+std::vector<TPlugIn> LoadPlugIns(std::vector<TPlugInFile> const& files, std::optional<TSample> const& sample = std::nullopt);
+
+// The same for the plug-ins that FindPlugIns finds. Throws TZEPException only if the plug-in directory cannot be read.
 std::vector<TPlugIn> LoadPlugIns(std::optional<TSample> const& sample = std::nullopt);
 
 // The namespaces of all providers that did not fail. A view shares ownership of its namespace with the plug-in.
@@ -57,12 +62,7 @@ std::string FailurePhraseOf(TPlugIn const& plugIn, TProviderRun const& run);
 // "name: phrase" for each plug-in and provider that failed.
 std::vector<std::string> FailuresOf(std::vector<TPlugIn> const& plugIns);
 
-// The names of the plug-ins in the plug-in directory, sorted; and the path of one. Throws TZEPException if the directory cannot
-// be read.
-std::vector<std::string> PlugInNames();
-std::string PlugInFile(std::string const& name);
-
-// The directory that is searched for plug-ins.
-std::string PlugInDirectory();
+// The result for a file that was meant to be a plug-in but is passed over.
+TPlugIn PassedOver(TPlugInFile const& file);
 
 }  // namespace NQRVZEP20

@@ -23,13 +23,13 @@ constexpr std::chrono::milliseconds kShowEvery(100);
 // The processes of all plug-ins, in the order of the plug-ins.
 class TPool {
 public:
-  TPool(std::vector<std::string> names, std::string const& sampleLabel, TApartOptions const& options)
-      : fNames(std::move(names)),
+  TPool(std::vector<TPlugInFile> files, std::string const& sampleLabel, TApartOptions const& options)
+      : fFiles(std::move(files)),
         fSampleLabel(sampleLabel),
         fOptions(options),
         fParallel(options.fParallel != 0 ? options.fParallel : std::max(1u, std::thread::hardware_concurrency())),
-        fResults(fNames.size()),
-        fLogs(fNames.size()) {}
+        fResults(fFiles.size()),
+        fLogs(fFiles.size()) {}
 
   std::vector<TPlugIn> Run() {
     for (StartMore(); !fRunning.empty(); StartMore()) {
@@ -48,14 +48,17 @@ private:
   };
 
   void StartMore() {
-    for (; fNext < fNames.size() && fRunning.size() < fParallel; ++fNext) {
-      std::string const& name = fNames[fNext];
-      std::string const file = PlugInFile(name);
+    for (; fNext < fFiles.size() && fRunning.size() < fParallel; ++fNext) {
+      TPlugInFile const& file = fFiles[fNext];
+      if (!file.IsLoaded()) {
+        fResults[fNext] = PassedOver(file);
+        continue;
+      }
       try {
-        fRunning.push_back({fNext, std::make_unique<TPlugInProcess>(name, file, fOptions.fLimits, fSampleLabel)});
+        fRunning.push_back({fNext, std::make_unique<TPlugInProcess>(file.fName, file.fFile, fOptions.fLimits, fSampleLabel)});
       } catch (std::system_error const& failure) {
         if (!fRunning.empty()) return;  // it may be possible when another one has ended
-        fResults[fNext] = {name, file, 0, failure.what(), {}, NameOf(EStage::kOpen)};
+        fResults[fNext] = {file.fName, file.fFile, 0, failure.what(), {}, NameOf(EStage::kOpen)};
       }
     }
   }
@@ -97,7 +100,7 @@ private:
     for (TLogLine const& line : LogLinesOf(log)) TRootObject::GetCoreLogger()->OutputLogEntry(line.fSeverity, line.fMessage);
   }
 
-  std::vector<std::string> const fNames;
+  std::vector<TPlugInFile> const fFiles;
   std::string const fSampleLabel;
   TApartOptions const& fOptions;
   std::size_t const fParallel;
@@ -125,11 +128,18 @@ void RefuseTakenNames(std::vector<TPlugIn>& plugIns) {
 
 }  // namespace
 
-std::vector<TPlugIn> LoadPlugInsApart(std::optional<TSample> const& sample, TApartOptions const& options) {
+std::vector<TPlugIn> LoadPlugInsApart(std::vector<TPlugInFile> files, std::optional<TSample> const& sample,
+                                      TApartOptions const& options) {
   if (sample) SetForProviders(*sample);
-  std::vector<TPlugIn> plugIns = TPool(PlugInNames(), sample ? sample->fLabel : "", options).Run();
+  auto const isOfNoInterest = [](TPlugInFile const& file) { return !file.IsLoaded() && !file.fIsMeant; };
+  files.erase(std::remove_if(files.begin(), files.end(), isOfNoInterest), files.end());
+  std::vector<TPlugIn> plugIns = TPool(std::move(files), sample ? sample->fLabel : "", options).Run();
   RefuseTakenNames(plugIns);
   return plugIns;
+}
+
+std::vector<TPlugIn> LoadPlugInsApart(std::optional<TSample> const& sample, TApartOptions const& options) {
+  return LoadPlugInsApart(FindPlugIns(), sample, options);
 }
 
 }  // namespace NQRVZEP20

@@ -29,14 +29,17 @@ struct TApartOptions {
 
 // Like LoadPlugIns, but runs each plug-in in a process of its own, several in parallel, so that a faulty plug-in affects only
 // its own result. The namespaces are immutable copies, which the processes send in serialised form. The results are in the
-// order of the plug-in names; if two providers have the same name, the first one is used and the other one fails.
+// order of the files; if two providers have the same name, the first one is used and the other one fails.
 //
 // The printed output of a plug-in is in its result; its log entries are written to this process's log after it has ended. No
 // process that a plug-in started outlives this call or this process.
 //
 // Forks this process: call it before other threads are started. A plug-in can read the memory that this process had at that
-// time, so read passwords afterwards. Throws TZEPException only if the plug-in directory cannot be read. Blocks until all
-// plug-ins have ended or exceeded a limit.
+// time, so read passwords afterwards. Blocks until all plug-ins have ended or exceeded a limit.
+std::vector<TPlugIn> LoadPlugInsApart(std::vector<TPlugInFile> files, std::optional<TSample> const& sample = std::nullopt,
+                                      TApartOptions const& options = {});
+
+// The same for the plug-ins that FindPlugIns finds. Throws TZEPException only if the plug-in directory cannot be read.
 std::vector<TPlugIn> LoadPlugInsApart(std::optional<TSample> const& sample = std::nullopt, TApartOptions const& options = {});
 
 }  // namespace NQRVZEP20

@@ -2,8 +2,8 @@
 #include "collect/process/PlugInChild.h"
 
 #include "ILogger.h"
-#include "TOSSpecific.h"
 #include "TRootObject.h"
+#include "collect/PlugInFiles.h"
 #include "collect/answer/NamespaceBytes.h"
 #include "collect/process/Descriptors.h"
 #include "collect/process/EStage.h"
@@ -165,7 +165,7 @@ void Load(TChildSetup const& setup) {
   SendStage(EStage::kOpen);
   bool const runsItsCode = CanBeMapped(setup.fFile);
   if (runsItsCode) SendStage(EStage::kConstruction);
-  TTimedFailure const failure = TimedFailureOf([&] { TOSSpecific::LoadNSPLibrary(setup.fName); });
+  TTimedFailure const failure = TimedFailureOf([&] { LoadLibraryOf({setup.fName, setup.fFile}); });
   if (IsOfLinker(failure)) SendStage(EStage::kOpen);
   if (!failure.fMessage.empty()) Send(EMessage::kFailed, failure.ReasonOrMessage());
   Send(EMessage::kLoaded, std::to_string(failure.fMilliseconds));

@@ -8,7 +8,7 @@ namespace NQRVZEP20 {
 
 // The parameters of a plug-in process.
 struct TChildSetup {
-  std::string fName;           // the plug-in's base name, for TOSSpecific::LoadNSPLibrary
+  std::string fName;           // of the plug-in
   std::string fFile;           // the plug-in's path
   int fAnswer;                 // the descriptor to which the messages (Messages.h) are written
   int fWords;                  // the descriptor for standard output and standard error

@@ -35,6 +35,7 @@ constexpr TCommand kCommands[] = {
     {"report", "Report the identity and the hardware of this machine", AddReportArguments},
     {"show", "Print one object or class of the providers' namespaces, or of a MOF file", AddShowArguments},
     {"classes", "List the classes of the providers' namespaces, or of a MOF file", AddClassesArguments},
+    {"plugins", "List the plug-ins, and why files are not loaded as plug-ins", AddPluginsArguments},
     {"mof", "Load and check a schema in MOF", AddMofArguments},
     {"media", "List, mount and unmount removable media", AddMediaArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},

@@ -145,6 +145,7 @@ TRun AddClassesArguments(CLI::App& command) {
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.add_flag("--sample", arguments->fSample, "List the classes for the bundled sample, labelled SAMPLE")->excludes(mof);
   AddPlugInOptions(command, arguments->fPlugIns);
+  command.get_option("--plugin")->excludes(mof);
   command.footer(
       "Exit status: 0 when there are classes, 2 when there are classes but a plug-in failed, 1 when there are none,\n"
       "64 for wrong usage.");

@@ -53,19 +53,39 @@ void AddPlugInOptions(CLI::App& command, TPlugInArguments& arguments) {
                 "Load the plug-ins into the zep process, for debugging; a plug-in that crashes or hangs then takes zep with it")
       ->excludes(timeout)
       ->excludes(memory);
+  command
+      .add_option("--plugin", arguments.fChoice.fFiles,
+                  "Also load this plug-in, from anywhere, without installing it (repeatable); it takes the place of an installed "
+                  "plug-in of the same name")
+      ->type_name("FILE")
+      ->allow_extra_args(false);
+  command.add_flag("--allow-writable", arguments.fChoice.fAllowWritable,
+                   "As root, also load plug-ins that other users may replace");
+}
+
+std::vector<TPlugInFile> FindPlugInsFor(TPlugInArguments const& arguments) {
+  std::vector<TPlugInFile> files = FindPlugIns(arguments.fChoice);
+  for (TPlugInFile& file : files)
+    if (file.fRule == EPlugInRule::kWritable) file.fReason += "; --allow-writable loads it nevertheless";
+  return files;
 }
 
 std::vector<TPlugIn> LoadPlugInsFor(TPlugInArguments const& arguments, std::optional<TSample> const& sample) {
+  return LoadPlugInsFor(arguments, sample, FindPlugInsFor(arguments));
+}
+
+std::vector<TPlugIn> LoadPlugInsFor(TPlugInArguments const& arguments, std::optional<TSample> const& sample,
+                                    std::vector<TPlugInFile> const& files) {
   if (arguments.fInProcess) {
     TOutputGuard const guard;
-    return LoadPlugIns(sample);
+    return LoadPlugIns(files, sample);
   }
   TPlugInProgress progress;
   TApartOptions options;
   options.fLimits.fTimeoutSeconds = arguments.fTimeoutSeconds;
   options.fLimits.fMemoryMebibytes = arguments.fMemoryMebibytes;
   options.fShowProgress = [&progress](std::vector<TPlugInAtWork> const& atWork) { progress.Show(atWork); };
-  std::vector<TPlugIn> plugIns = LoadPlugInsApart(sample, options);
+  std::vector<TPlugIn> plugIns = LoadPlugInsApart(files, sample, options);
   for (TPlugIn const& plugIn : plugIns) WriteWords(plugIn);
   return plugIns;
 }

@@ -22,8 +22,9 @@ TSample BundledSample();
 // The bundled sample if the command was called with --sample (`isWanted`); otherwise none.
 std::optional<TSample> SampleIf(bool isWanted);
 
-// How a command loads plug-ins.
+// Which plug-ins a command loads, and how.
 struct TPlugInArguments {
+  TPlugInChoice fChoice;
   bool fInProcess = false;
   int fTimeoutSeconds = 60;
   std::uint64_t fMemoryMebibytes = 0;  // 0: no limit
@@ -31,8 +32,13 @@ struct TPlugInArguments {
 
 void AddPlugInOptions(CLI::App& command, TPlugInArguments& arguments);
 
+// The files that may be plug-ins.
+std::vector<TPlugInFile> FindPlugInsFor(TPlugInArguments const& arguments);
+
 // Loads the plug-ins, each in a process of its own, or with fInProcess in this one. If standard error is a terminal, progress
 // is shown on it; afterwards the output of the plug-ins is written to standard error. Blocks until all plug-ins have ended.
 std::vector<TPlugIn> LoadPlugInsFor(TPlugInArguments const& arguments, std::optional<TSample> const& sample);
+std::vector<TPlugIn> LoadPlugInsFor(TPlugInArguments const& arguments, std::optional<TSample> const& sample,
+                                    std::vector<TPlugInFile> const& files);
 
 }  // namespace NQRVZEP20::zep

@@ -313,6 +313,7 @@ TRun AddShowArguments(CLI::App& command) {
   command.add_flag("--sample", arguments->fSample, "Show objects of the bundled sample, an invented server, labelled SAMPLE")
       ->excludes(mof);
   AddPlugInOptions(command, arguments->fPlugIns);
+  command.get_option("--plugin")->excludes(mof);
   command.footer("Exit status: 0 when there is such an object, 1 when there is none, 64 for wrong usage.");
   return [arguments] { return Show(*arguments); };
 }

@@ -3,6 +3,7 @@
 
 #include "ICIMInstance.h"
 #include "collect/FailureOf.h"
+#include "tools/zep/output/PlugInRows.h"
 #include "tools/zep/output/ReportPhrases.h"
 
 namespace NQRVZEP20::zep {
@@ -24,24 +25,7 @@ TJson RowsAsJson(std::vector<TReportRow> const& rows) {
 
 TJson PlugInsAsJson(std::vector<TPlugIn> const& plugIns) {
   TJson json = TJson::array();
-  for (TPlugIn const& plugIn : plugIns) {
-    TJson providers = TJson::array();
-    for (TProviderRun const& provider : plugIn.fProviders)
-      providers.push_back({{"name", provider.fName},
-                           {"namespace", provider.fView ? TJson(provider.fView->GetName()) : TJson(nullptr)},
-                           {"milliseconds", provider.fMilliseconds},
-                           {"error", OrNull(provider.fError)},
-                           {"stage", OrNull(provider.fStage)},
-                           {"lastLogLine", OrNull(provider.fLastLogLine)}});
-    json.push_back({{"name", plugIn.fName},
-                    {"file", plugIn.fFile},
-                    {"milliseconds", plugIn.fMilliseconds},
-                    {"error", OrNull(plugIn.fError)},
-                    {"stage", OrNull(plugIn.fStage)},
-                    {"lastLogLine", OrNull(plugIn.fLastLogLine)},
-                    {"words", OrNull(plugIn.fWords)},
-                    {"providers", providers}});
-  }
+  for (TPlugIn const& plugIn : plugIns) json.push_back(PlugInAsJson(plugIn));
   return json;
 }
 

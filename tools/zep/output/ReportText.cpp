@@ -1,11 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/output/ReportText.h"
 
+#include "tools/zep/output/PlugInRows.h"
 #include "tools/zep/output/ReportPhrases.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/secrets/Secrets.h"
-
-#include <cstdio>
 
 namespace NQRVZEP20::zep {
 
@@ -26,33 +25,10 @@ std::string RowsAsText(std::string const& title, std::vector<TReportRow> const& 
   return table.GetText();
 }
 
-std::string AsMilliseconds(double milliseconds) {
-  char text[32];
-  std::snprintf(text, sizeof text, "%.1f ms", milliseconds);
-  return text;
-}
-
-std::string ResultOf(TPlugIn const& plugIn) {
-  if (!plugIn.fError.empty()) return "failed: " + MessageWithoutSecrets(FailurePhraseOf(plugIn));
-  if (plugIn.fProviders.empty()) return "loaded, but registered no provider of its own";
-  std::string text;
-  for (TProviderRun const& provider : plugIn.fProviders) {
-    if (!text.empty()) text += "; ";
-    text += provider.fError.empty()
-                ? "filled " + provider.fView->GetName()
-                : "provider " + provider.fName + " failed: " + MessageWithoutSecrets(FailurePhraseOf(plugIn, provider));
-  }
-  return text;
-}
-
 std::string PlugInsAsText(std::string const& title, std::vector<TPlugIn> const& plugIns) {
   TTable table({15, 10, 51});
   table.Add({title, "Time", "Result"});
-  for (TPlugIn const& plugIn : plugIns) {
-    double milliseconds = plugIn.fMilliseconds;
-    for (TProviderRun const& provider : plugIn.fProviders) milliseconds += provider.fMilliseconds;
-    table.Add({plugIn.fName, AsMilliseconds(milliseconds), ResultOf(plugIn)});
-  }
+  for (TPlugIn const& plugIn : plugIns) table.Add({plugIn.fName, TimeTextOf(plugIn), ResultOf(plugIn)});
   if (plugIns.empty()) table.Add({"none", "0.0 ms", "no file lib*.nsp.so in " + PlugInDirectory()});
   return table.GetText();
 }

@@ -1,0 +1,188 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/PlugInFiles.h"
+
+#include "TOSSpecific.h"
+#include "TZEPException.h"
+#include "core/Handles.h"
+
+#include <fcntl.h>
+#include <grp.h>
+#include <link.h>
+#include <pwd.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <cstring>
+#include <filesystem>
+#include <set>
+#include <system_error>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+std::string const kPrefix = "lib";
+
+struct TRuling {
+  EPlugInRule fRule = EPlugInRule::kNone;
+  std::string fReason = {};
+};
+
+std::string TextOfError(int error) { return std::generic_category().message(error); }
+
+bool HasNameOfPlugIn(std::string const& fileName) {
+  return fileName.size() > kPrefix.size() + kNSPExtension.size() && fileName.compare(0, kPrefix.size(), kPrefix) == 0 &&
+         fileName.compare(fileName.size() - kNSPExtension.size(), std::string::npos, kNSPExtension) == 0;
+}
+
+std::string NameOfPlugIn(std::string const& fileName) {
+  if (!HasNameOfPlugIn(fileName)) return fileName;
+  return fileName.substr(kPrefix.size(), fileName.size() - kPrefix.size() - kNSPExtension.size());
+}
+
+// ---- Who may write ----
+
+std::string UserName(uid_t user) {
+  passwd const* const entry = ::getpwuid(user);
+  return entry != nullptr ? entry->pw_name : std::to_string(user);
+}
+
+std::string GroupName(gid_t group) {
+  ::group const* const entry = ::getgrgid(group);
+  return entry != nullptr ? entry->gr_name : std::to_string(group);
+}
+
+// Such as "the group staff may write /usr/local/lib"; empty when only root and the caller may.
+std::string WhoElseMayWrite(fs::path const& path) {
+  struct stat status {};
+  if (::stat(path.c_str(), &status) != 0) return "";
+  if (status.st_uid != 0 && status.st_uid != ::getuid()) return "the user " + UserName(status.st_uid) + " owns " + path.string();
+  if (S_ISDIR(status.st_mode) && (status.st_mode & S_ISVTX) != 0) return "";
+  if ((status.st_mode & S_IWOTH) != 0) return "every user may write " + path.string();
+  if ((status.st_mode & S_IWGRP) != 0 && status.st_gid != 0)
+    return "the group " + GroupName(status.st_gid) + " may write " + path.string();
+  return "";
+}
+
+// The same for the file and every directory above it, on the way to it with and without symbolic links.
+std::string WhoElseMayReplace(fs::path const& file) {
+  std::error_code ignored;
+  for (fs::path const& way : {fs::absolute(file).lexically_normal(), fs::canonical(file, ignored)})
+    for (fs::path at = way; !at.empty(); at = at.has_relative_path() ? at.parent_path() : fs::path()) {
+      std::string const who = WhoElseMayWrite(at);
+      if (!who.empty()) return who;
+    }
+  return "";
+}
+
+// ---- The rules ----
+
+TRuling RuleOfMissing(fs::path const& file, int error) {
+  std::error_code noLink;
+  fs::path const target = fs::read_symlink(file, noLink);
+  if (error == EACCES) return {EPlugInRule::kPermission, "this user may not read it"};
+  if (!noLink && error == ENOENT)
+    return {EPlugInRule::kMissing, "it is a symbolic link to " + target.string() + ", which does not exist"};
+  return {EPlugInRule::kMissing, TextOfError(error)};
+}
+
+std::string WordForKind(mode_t mode) {
+  if (S_ISDIR(mode)) return "a directory";
+  if (S_ISFIFO(mode)) return "a FIFO (named pipe)";
+  if (S_ISSOCK(mode)) return "a socket";
+  return "a device";
+}
+
+TUniqueFd OpenToRead(std::string const& file) {
+  return TUniqueFd(::open(file.c_str(), O_RDONLY | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
+}
+
+TRuling RuleOfPermission(fs::path const& file) {
+  TUniqueFd const fd = OpenToRead(file);
+  if (!fd && (errno == EACCES || errno == EPERM)) return {EPlugInRule::kPermission, "this user may not read it"};
+  if (!fd) return {EPlugInRule::kPermission, TextOfError(errno)};
+  return {};
+}
+
+TRuling RuleOfFile(fs::path const& file, bool allowWritable) {
+  struct stat status {};
+  if (::stat(file.c_str(), &status) != 0) return RuleOfMissing(file, errno);
+  if (!S_ISREG(status.st_mode)) return {EPlugInRule::kKind, "it is " + WordForKind(status.st_mode)};
+  TRuling const permission = RuleOfPermission(file);
+  if (permission.fRule != EPlugInRule::kNone || allowWritable || ::geteuid() != 0) return permission;
+  std::string const who = WhoElseMayReplace(file);
+  if (who.empty()) return {};
+  return {EPlugInRule::kWritable, "it would run as root, but " + who};
+}
+
+TPlugInFile Installed(fs::path const& file, bool allowWritable) {
+  std::string const fileName = file.filename().string();
+  bool const hasName = HasNameOfPlugIn(fileName);
+  TRuling ruling{EPlugInRule::kName, "its name is not lib<NAME>" + kNSPExtension};
+  if (hasName) ruling = RuleOfFile(file, allowWritable);
+  return {NameOfPlugIn(fileName), file.string(), ruling.fRule, ruling.fReason, fileName.find(".nsp") != fileName.npos};
+}
+
+TPlugInFile Tried(std::string const& name, bool allowWritable) {
+  fs::path const file = fs::absolute(name).lexically_normal();
+  TRuling const ruling = RuleOfFile(file, allowWritable);
+  return {NameOfPlugIn(file.filename().string()), file.string(), ruling.fRule, ruling.fReason};
+}
+
+std::vector<fs::path> FilesOfDirectory(std::string const& directory) {
+  std::vector<fs::path> files;
+  try {
+    for (fs::directory_entry const& entry : fs::directory_iterator(directory)) files.push_back(entry.path());
+  } catch (fs::filesystem_error const&) {
+    throw TZEPException(kZEPStatusFileSystemError);
+  }
+  std::sort(files.begin(), files.end());
+  return files;
+}
+
+}  // namespace
+
+std::string NameOf(EPlugInRule rule) {
+  static char const* const names[] = {"", "name", "missing", "kind", "permission", "writable", "replaced"};
+  return names[static_cast<std::size_t>(rule)];
+}
+
+std::string PlugInDirectory() { return fs::path(TOSSpecific::GetZEPRootPath()).lexically_normal().string(); }
+
+std::vector<TPlugInFile> FindPlugIns(TPlugInChoice const& choice) {
+  std::vector<TPlugInFile> files;
+  std::set<std::string> tried;  // the names of plug-ins
+  for (std::string const& file : choice.fFiles) {
+    files.push_back(Tried(file, choice.fAllowWritable));
+    tried.insert(files.back().fName);
+  }
+  for (fs::path const& path : FilesOfDirectory(PlugInDirectory())) {
+    files.push_back(Installed(path, choice.fAllowWritable));
+    TPlugInFile& file = files.back();
+    if (!file.IsLoaded() || tried.count(file.fName) == 0) continue;
+    file.fRule = EPlugInRule::kReplaced;
+    file.fReason = "a plug-in of the same name is tried in its place";
+    file.fIsMeant = false;
+  }
+  return files;
+}
+
+bool IsElfFile(std::string const& file) {
+  TUniqueFd const fd = OpenToRead(file);
+  char magic[SELFMAG] = {};
+  return fd && ::pread(fd.get(), magic, SELFMAG, 0) == SELFMAG && std::memcmp(magic, ELFMAG, SELFMAG) == 0;
+}
+
+void LoadLibraryOf(TPlugInFile const& plugIn) {
+  fs::path const file = plugIn.fFile;
+  if (file.parent_path() == PlugInDirectory() && HasNameOfPlugIn(file.filename().string()))
+    TOSSpecific::LoadNSPLibrary(plugIn.fName);
+  else
+    TOSSpecific::LoadPluginLibrary(plugIn.fFile);
+}
+
+}  // namespace NQRVZEP20
