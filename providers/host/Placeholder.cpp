@@ -122,7 +122,7 @@ TFinding<std::string> HostNameOf(std::string const& nodeName) {
 }
 
 TFinding<std::string> WithoutPlaceholder(std::string const& text) {
-  if (WithoutOuterBlanks(text).empty()) return TMissing{kMissingNotGiven, "blank in the firmware"};
+  if (WithoutOuterBlanks(text).empty()) return TMissing{kMissingNotGiven, "the firmware reports only blanks"};
   if (HasOnly(WithoutOuterBlanks(text), '\xff'))  // flash memory that was never written
     return TMissing{kMissingNotGiven, "not programmed in the firmware's table (0xFF)"};
   if (IsPlaceholder(text)) return TMissing{kMissingPlaceholder, "placeholder text of the firmware: \"" + text + "\""};

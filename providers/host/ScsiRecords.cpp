@@ -72,7 +72,7 @@ TText ReadLine(std::string const& file) {
   std::string line;
   if (!std::getline(stream, line)) return TMissing{kMissingUnreadable, file + " cannot be read"};
   std::size_t const first = line.find_first_not_of(' ');
-  if (first == std::string::npos) return TMissing{kMissingNotGiven, "blank in the device"};
+  if (first == std::string::npos) return TMissing{kMissingNotGiven, "the device reports only blanks"};
   return line.substr(first, line.find_last_not_of(' ') - first + 1);
 }
 

@@ -42,8 +42,8 @@ TMissing WhyTablesFailed(TSmbiosTables const& tables, std::string const& tableFi
     if (status == kSmbiosFileSystemError) return {kMissingUnreadable, what + " cannot be read" + Reason(status, error)};
     return {kMissingUnreadable, what + " does not contain an SMBIOS table"};
   }
-  if (status == kSmbiosFileNotFound) return {kMissingNoTables, "no SMBIOS tables exported"};
-  if (status == kSmbiosAccessDenied) return {kMissingNeedsRoot, "needs root (SMBIOS tables)"};
+  if (status == kSmbiosFileNotFound) return {kMissingNoTables, "the system exports no SMBIOS tables"};
+  if (status == kSmbiosAccessDenied) return {kMissingNeedsRoot, "only root can read the SMBIOS tables"};
   return {kMissingUnreadable, "the system's SMBIOS tables cannot be read" + Reason(status, error)};
 }
 

@@ -82,7 +82,7 @@ TEST(PlaceholderTest, APlaceholderOrBlankTextIsMissing) {
     auto const missing = WithoutPlaceholder(std::string(blank));
     ASSERT_FALSE(missing);
     EXPECT_EQ(missing.Why().fCode, "not-given");
-    EXPECT_EQ(missing.Why().fReason, "blank in the firmware");
+    EXPECT_EQ(missing.Why().fReason, "the firmware reports only blanks");
   }
 }
 

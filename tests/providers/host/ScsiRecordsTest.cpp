@@ -88,8 +88,8 @@ TEST_F(ScsiRecordsTest, PaddingBlanksAreRemoved) {
 TEST_F(ScsiRecordsTest, AMissingValueOfADeviceHasAReason) {
   fDevices.Add("0:0:0:0", "0", "        ", "M", "R");
   std::filesystem::remove(fPath + "/0:0:0:0/rev");
-  EXPECT_THAT(Records(),
-              ElementsAre("0:0:0:0|Direct Access Device|<blank in the device>|M|<" + fPath + "/0:0:0:0/rev cannot be read>"));
+  EXPECT_THAT(Records(), ElementsAre("0:0:0:0|Direct Access Device|<the device reports only blanks>|M|<" + fPath +
+                                     "/0:0:0:0/rev cannot be read>"));
 }
 
 TEST_F(ScsiRecordsTest, ADeviceThatIsRemovedMeanwhileIsOmitted) {

@@ -80,7 +80,7 @@ TEST(SystemRecordTest, PlaceholdersAndMissingFieldsAreNullWithAReason) {
       {{"CreationClassName", "string QRVSG_ComputerSystem"},
        {"Name", "string db1"},
        {"Manufacturer", "string NULL placeholder: placeholder text of the firmware: \"System manufacturer\""},
-       {"ProductName", "string NULL not-given: blank in the firmware"},
+       {"ProductName", "string NULL not-given: the firmware reports only blanks"},
        {"Version", std::string("string ") + kNoText},
        {"SerialNumber", "string NULL unexpected-form: the firmware refers to string 9, which the structure does not contain"},
        {"UUID", "string NULL not-given: not set by the firmware (all zeros)"},

@@ -156,8 +156,8 @@ TEST_F(FakeSmbiosTest, TheLibrarysStatusIsTheReason) {
   struct TRow {
     char const *fBehaviour, *fCode, *fReason;
   } const rows[] = {
-      {"is missing its file", "no-smbios", "no SMBIOS tables exported"},
-      {"is denied access", "needs-root", "needs root (SMBIOS tables)"},
+      {"is missing its file", "no-smbios", "the system exports no SMBIOS tables"},
+      {"is denied access", "needs-root", "only root can read the SMBIOS tables"},
       {"fails", "unreadable", "the system's SMBIOS tables cannot be read"},
       {"cannot read", "unreadable", "the system's SMBIOS tables cannot be read: Input/output error"},
       {"cannot read and leaves no errno", "unreadable", "the system's SMBIOS tables cannot be read"},

@@ -228,9 +228,9 @@ TEST_F(ZepMediaTest, AnotherDevicesPartitionIsNeverUsedAsTheFirstPartition) {
               Do("umount /mnt/key");
               return text;
             }),
-            "zep: /dev/shm/key1 was not mounted: the mount would also try /dev/shm/key11, which is not a partition of "
+            "zep: /dev/shm/key1 was not mounted: mounting it would also try /dev/shm/key11, which is not a partition of "
             "/dev/shm/key1\nexit status 1\n"
-            "zep: /dev/shm/key1 was not mounted: the mount would also try /dev/shm/key11, which is not a partition of "
+            "zep: /dev/shm/key1 was not mounted: mounting it would also try /dev/shm/key11, which is not a partition of "
             "/dev/shm/key1\nexit status 1\n"
             "unmounted\n"
             "zep: /dev/shm/key11 is already mounted at /mnt/key; unmount it first\nexit status 1\n"

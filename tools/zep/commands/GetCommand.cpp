@@ -97,8 +97,8 @@ TRun AddGetArguments(CLI::App& command) {
   command.footer(
       "An existing file is overwritten only after confirmation, which requires a terminal. A symbolic link remains, and\n"
       "its target is overwritten. Until the download is complete, the file name ends in \".part\". A failed transfer leaves\n"
-      "that file and a note of its URL and size, \".part.from\". The next transfer from the same URL continues the file when\n"
-      "the server supports this and reports the same time (FTP: MDTM) and size; otherwise it fetches the file again.\n" +
+      "that file and a note of its URL and size, \".part.from\". The next transfer from the same URL resumes the download when\n"
+      "the server supports this (FTP: MDTM and REST) and reports the same time and size; otherwise it starts again.\n" +
       TransferHelp());
   return [arguments] { return Get(*arguments); };
 }

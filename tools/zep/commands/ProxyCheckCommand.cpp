@@ -155,11 +155,10 @@ TRun AddProxyCheckArguments(CLI::App& command) {
                 "The size limit for the page, such as 500K or 2M (default 1M); 0: no limit");
   AddTransferOptions(command, arguments->fOptions);
   command.footer(
-      "Fetches a web page through the proxy and checks that the returned page is the expected one.\n"
-      "The password comes from netrc or from a prompt.\n"
-      "Exit status: 0 when the page was returned, 1 when it was not, 64 for wrong usage, 68 when the proxy\n"
-      "is unknown or does not answer, 69 when libcurl is missing,\n"
-      "75 when no data arrived for the seconds of --stall.");
+      "Fetches a web page through the proxy and checks that the returned page contains the expected text. The password comes\n"
+      "from the argument (which other users may see in the list of processes), from netrc, or from a prompt.\n"
+      "Exit status: 0 when the expected page was returned, 1 when it was not, 64 for wrong usage, 68 when the proxy is\n"
+      "unknown or does not answer, 69 when libcurl is missing, 75 when no data arrived for the seconds of --stall.");
   return [arguments] { return ProxyCheck(*arguments); };
 }
 

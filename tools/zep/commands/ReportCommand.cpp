@@ -144,13 +144,13 @@ TRun AddReportArguments(CLI::App& command) {
   command.add_option("--send", arguments->fTarget,
                      "Also send the JSON document, compressed: ftp://[USER@]HOST[:PORT]/DIRECTORY/, sftp://..., or\n"
                      "[USER@]HOST[:PORT] alone. A report that cannot be sent is kept in a file, whose path is printed");
-  command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
+  command.add_flag("--sftp", arguments->fBySftp, "Use SFTP instead of FTP for a target without ftp:// or sftp://");
   AddUploadOptions(command, arguments->fOptions);
   AddPlugInOptions(command, arguments->fPlugIns);
   command.footer(
       "Exit status: 0 when the identity is complete, even if details are missing, 2 when part of the identity is missing or\n"
-      "a plug-in failed, 1 when none of it is known or the medium could not be written or unmounted, 64 for wrong usage;\n"
-      "when the report could not be sent, the exit status of zep send.");
+      "a plug-in failed, 1 when none of it is known or the medium could not be mounted, written or unmounted, 64 for wrong\n"
+      "usage; when the report could not be sent, the exit status of zep send.");
   return [arguments] { return Report(*arguments); };
 }
 

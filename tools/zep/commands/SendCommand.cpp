@@ -42,17 +42,18 @@ TRun AddSendArguments(CLI::App& command) {
       ->required();
   command.add_option("--as", arguments->fName,
                      "The name of the file on the server, for a host or a URL that ends in \"/\"; default: the file's own name");
-  command.add_flag("--sftp", arguments->fBySftp, "Send to a host by SFTP instead of FTP");
+  command.add_flag("--sftp", arguments->fBySftp, "Use SFTP instead of FTP for a target without ftp:// or sftp://");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddUploadOptions(command, arguments->fOptions);
   command.footer(
       "Missing directories are created on the server. The file is sent under a temporary name, which ends in a number and\n"
       "\".part\", and is renamed when the upload is complete. This replaces a file or link of that name, but never a directory.\n"
-      "The server chooses the mode of the new file; only from an SFTP server that lists the mode of the replaced file and\n"
-      "refuses to rename onto it, as OpenSSH does, does the new file get that mode. If the server refuses to rename, the\n"
-      "file is sent to its final name directly. When only a host is given, the file goes to the directory of the user or,\n"
-      "when ZEP_ISBOOTABLE is \"yes\", to hostline/toqrv/vantor/fdr_upload.\n" +
-      TransferHelp() + "\nAlso 2 when the file changed during the upload.");
+      "The server chooses the mode of the new file. Exception: if an SFTP server lists the mode of the existing file and\n"
+      "refuses to rename onto it, as OpenSSH does, the new file gets that mode. If the server refuses to rename, the file is\n"
+      "sent directly under its final name. When only a host is given, the file goes to the directory of the user or, when\n"
+      "ZEP_ISBOOTABLE is \"yes\", to hostline/toqrv/vantor/fdr_upload.\n" +
+      TransferHelp() +
+      "\nAlso 2 when the file was sent, but it changed during the upload or its checksum could not be computed.");
   return [arguments] { return Send(*arguments); };
 }
 

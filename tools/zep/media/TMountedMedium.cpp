@@ -60,7 +60,7 @@ void RefuseOther(std::optional<TMount> const& mount, std::string const& mountPoi
 void RefuseForeignPartition(std::string const& device) {
   std::string const next = FirstPartitionOf(device);
   if (NumberOf(next) != 0 && !IsPartitionOf(next, device))
-    Throw(device + " was not mounted: the mount would also try " + next + ", which is not a partition of " + device);
+    Throw(device + " was not mounted: mounting it would also try " + next + ", which is not a partition of " + device);
 }
 
 // The library runs the program through the shell, where a missing program cannot be distinguished from an unreadable medium.
@@ -90,7 +90,8 @@ TMount MountOrThrow(std::string const& device, std::string const& mountPoint) {
     Throw(device + " cannot be mounted: neither it nor " + FirstPartitionOf(device) + " has a readable file system");
   }
   std::optional<TMount> const mount = MountAt(mountPoint);
-  if (!mount) Throw(device + " was not mounted: another mount point ends in " + mountPoint + "; unmount it first");
+  if (!mount)
+    Throw(device + " was not mounted, because the path of another mount point ends in " + mountPoint + "; unmount that first");
   RefuseOther(mount, mountPoint, device);
   return *mount;
 }

@@ -21,11 +21,11 @@ namespace NQRVZEP20::zep {
 namespace {
 
 void CheckHost(std::string const& host) {
-  if (host.empty()) throw TWrongUsage("no host is named");
+  if (host.empty()) throw TWrongUsage("the host is missing");
   bool const isAddress = host.front() == '[' && host.back() == ']';  // an IPv6 address
   for (char const c : host)
     if (!IsUnreserved(c) && !(isAddress && std::string_view("[:]").find(c) != std::string_view::npos))
-      throw TWrongUsage("the host has a character that no host name has");
+      throw TWrongUsage("the host contains a character that is not allowed in a host name");
 }
 
 void CheckPort(std::string const& port) {
@@ -58,7 +58,8 @@ void CheckForPassword(std::string const& authority, std::string const& path) {
   bool const hasPort = authority.find(':', authority.front() == '[' ? authority.find(']') : 0) != authority.npos;
   bool const hasUser = authority.find('@') != authority.npos;
   if (hasPort && !hasUser && path.find('@') != path.npos)
-    throw TWrongUsage("the first \"/\" comes before an \"@\": write a \"/\" in a password as %2F, an \"@\" in a path as %40");
+    throw TWrongUsage(
+        "the first \"/\" comes before an \"@\", which is ambiguous: write \"/\" in a password as %2F, or \"@\" in a path as %40");
 }
 
 // ---- Passwords ----
@@ -135,7 +136,7 @@ void CheckNetrc(TPrivateFile const& file, std::string const& path, bool isOption
   if (file.Error() == 0) return;
   if (isOption) throw TWrongUsage(NameOfPrivateFile(path, "--netrc") + ": " + file.Reason());
   if (file.Error() == ENOENT || file.Error() == ENOTDIR) return;  // as with HOME=/dev/null
-  std::cerr << "zep: warning: " << Printable(path) << " cannot be read, and no login is taken from it: " << file.Reason() << "\n";
+  std::cerr << "zep: warning: " << Printable(path) << " cannot be read and is ignored: " << file.Reason() << "\n";
 }
 
 // `netrcFile`: the file of --netrc, or empty.

@@ -279,7 +279,7 @@ TTransferred WithChecksum(TTransferred transferred, struct stat const& before) {
 TTransferred BrokenOff(TTransferred transferred, bool wasThere, TTransferState const& state, TTransferOptions const& options) {
   std::string const& part = transferred.fFile;
   if (transferred.fOutcome.fStatus == kZEPStatusAlreadyExists)
-    return Failed(transferred, kExitNotWritten, "another program has made this file meanwhile");
+    return Failed(transferred, kExitNotWritten, "another program has created this file in the meantime");
   if (state.fIsTooLarge) {
     transferred.fOutcome.fReason = "the file is larger than " + ExactSizeText(options.fMostBytes) + "; --max-size allows more";
     bool const isKept = wasThere || (::unlink(part.c_str()) != 0 && errno != ENOENT);
@@ -318,8 +318,8 @@ void AddTransferOptions(CLI::App& command, TTransferOptions& options) {
   command.add_flag("--quiet", options.fQuiet, "Do not print the progress, or a message after a success");
   command
       .add_option("--stall", options.fStallSeconds,
-                  "The number of seconds without progress after which the transfer is ended (60); 0: never. In an upload,\n"
-                  "bytes count when they are read, so the last few MiB must reach the server within this time")
+                  "The number of seconds without progress after which the transfer is ended (default 60); 0: never. In an\n"
+                  "upload, bytes count when they are read, so the last few MiB must reach the server within this time")
       ->check(CLI::Range(0, 86400));
   command.add_option("--netrc", options.fNetrc, "The netrc file with users and passwords (default: $NETRC, or ~/.netrc)");
 }
@@ -328,8 +328,8 @@ void AddUploadOptions(CLI::App& command, TTransferOptions& options) {
   AddTransferOptions(command, options);
   command
       .add_option("--clean-up", options.fCleanUpSeconds,
-                  "The time limit, in seconds, for removing an incomplete file from the server after a failure (10; after\n"
-                  "a stall or an interrupt 5)")
+                  "The time limit, in seconds, for removing an incomplete file from the server after a failure (default 10,\n"
+                  "after a stall or an interrupt 5, but not more than half of --stall)")
       ->check(CLI::Range(1, 3600));
 }
 
@@ -355,8 +355,10 @@ bool IsUrl(std::string const& text) { return text.find("://") != text.npos; }
 
 TTarget TargetOf(std::string const& text, bool bySftp) {
   TTarget target{RemoteOf(text, bySftp ? "sftp" : "ftp"), !IsUrl(text)};
-  if (target.fRemote.fScheme != "ftp" && target.fRemote.fScheme != "sftp") throw TWrongUsage("only ftp:// and sftp:// are known");
-  if (target.fIsHost && !target.fRemote.fPath.empty()) throw TWrongUsage("a host has no path; write a URL");
+  if (target.fRemote.fScheme != "ftp" && target.fRemote.fScheme != "sftp")
+    throw TWrongUsage("only ftp:// and sftp:// are supported");
+  if (target.fIsHost && !target.fRemote.fPath.empty())
+    throw TWrongUsage("a host alone has no path; write a URL that begins with ftp:// or sftp://");
   return target;
 }
 
@@ -412,7 +414,7 @@ void WarnOfLeft(TTransferred const& transferred) {
   for (std::string const& url : transferred.fLeftOnServer) {
     bool const isFormer = url == transferred.fFormerUrl;
     std::cerr << "zep: warning: the server did not remove " << url
-              << (isFormer ? ", the file that was replaced\n" : ", which the upload needed for a while\n");
+              << (isFormer ? ", the file that was replaced\n" : ", a temporary file of this upload\n");
   }
 }
 

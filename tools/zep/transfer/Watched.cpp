@@ -90,7 +90,7 @@ bool EndsWith(std::string const& text, std::string const& end) {
 
 TOutcome OutcomeOf(std::string const& report) {
   std::size_t const blank = report.find(' ');
-  if (blank == report.npos) return {kZEPStatusFail, kExitNothing, "the process of the transfer died"};
+  if (blank == report.npos) return {kZEPStatusFail, kExitNothing, "the process of the transfer ended without a result"};
   TZEPStatusCode const status(static_cast<EZEPStatusCode>(std::stoi(report.substr(0, blank))));
   if (status == kZEPStatusOK) return {status, kExitComplete, ""};
   std::string reason = Printable(MessageWithoutSecrets(report.substr(blank + 1)));

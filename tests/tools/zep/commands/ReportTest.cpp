@@ -317,8 +317,8 @@ TEST_F(ReportTest, UnreadableSystemTablesHaveAReason) {
   struct TRow {
     char const *fBehaviour, *fMachine, *fCode;
   } const rows[] = {
-      {"is missing its file", "db1: not identified: no SMBIOS tables exported", "no-smbios"},
-      {"is denied access", "db1: not identified: needs root (SMBIOS tables)", "needs-root"},
+      {"is missing its file", "db1: not identified: the system exports no SMBIOS tables", "no-smbios"},
+      {"is denied access", "db1: not identified: only root can read the SMBIOS tables", "needs-root"},
       {"fails", "db1: not identified: the system's SMBIOS tables cannot be read", "unreadable"},
   };
   for (TRow const& row : rows) {

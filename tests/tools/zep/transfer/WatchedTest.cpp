@@ -49,7 +49,7 @@ TEST(RunWatchedTest, OutcomeIsTheFailureThatTheTransferThrows) {
          ::raise(SIGKILL);
          return kZEPStatusOK;
        },
-       kExitNothing, "the process of the transfer died"},
+       kExitNothing, "the process of the transfer ended without a result"},
   };
   TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogError, "an error before the transfer");
   Hide("topsecret");
