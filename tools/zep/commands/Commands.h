@@ -34,6 +34,7 @@ TRun AddGetArguments(CLI::App& command);         // GetCommand.cpp
 TRun AddHelpArguments(CLI::App& command);        // HelpCommand.cpp
 TRun AddMediaArguments(CLI::App& command);       // MediaCommand.cpp
 TRun AddMofArguments(CLI::App& command);         // MofCommand.cpp
+TRun AddPluginArguments(CLI::App& command);      // PluginCommand.cpp
 TRun AddPluginsArguments(CLI::App& command);     // PluginsCommand.cpp
 TRun AddProxyCheckArguments(CLI::App& command);  // ProxyCheckCommand.cpp
 TRun AddRemoteArguments(CLI::App& command);      // RemoteCommand.cpp

@@ -5,6 +5,7 @@
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/TPlugInProgress.h"
 #include "tools/zep/output/Text.h"
+#include "tools/zep/processes/SharePath.h"
 
 #include <CLI/CLI.hpp>
 
@@ -19,8 +20,6 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr char const* kSampleFromBinDir = "../share/zepcore/sample/smbios.bin";  // in a build tree and installed
-
 void WriteWords(TPlugIn const& plugIn) {
   std::istringstream words(plugIn.fWords);
   for (std::string line; std::getline(words, line);)
@@ -30,7 +29,7 @@ void WriteWords(TPlugIn const& plugIn) {
 }  // namespace
 
 TSample BundledSample() {
-  fs::path const file = (fs::read_symlink("/proc/self/exe").parent_path() / kSampleFromBinDir).lexically_normal();
+  fs::path const file = SharePath("sample/smbios.bin");
   if (!fs::is_regular_file(file)) throw std::runtime_error("the sample is not installed: " + file.string() + " is missing");
   return {file.string(), "sample-server", "SAMPLE"};
 }

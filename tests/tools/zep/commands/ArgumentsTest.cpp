@@ -100,6 +100,8 @@ TEST_F(ArgumentsTest, EmptyArgumentsAreRefused) {
       {{"show", ""}, "path"},
       {{"classes", "--mof", ""}, "--mof"},
       {{"mof", ""}, "file"},
+      {{"plugin", "new", "", "--class", "X"}, "name"},
+      {{"plugin", "new", "A", "--class="}, "--class"},
       {{"media", "mount", ""}, "device"},
       {{"media", "umount", ""}, "directory"},
       {{"config", ""}, "key"},

@@ -109,6 +109,9 @@ TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
       {"zep classes", 1, {"classes", "--json", "--mof", "/nowhere"}},
       {"zep plugins", 2, {"plugins", "--json", "--plugin", "/nowhere"}},
       {"zep mof", 1, {"mof", "--json", "bad.mof"}},
+      {"zep plugin", 64, {"plugin", "--json"}},
+      {"zep plugin new", 1, {"plugin", "new", "--json", "New", "--class", "X_None", "--mof", "good.mof"}},
+      {"zep plugin new", 64, {"plugin", "new", "--json", "not-a-name", "--class", "X_A", "--mof", "good.mof"}},
       {"zep media", 1, {"media", "--json"}},
       {"zep media", 1, {"media", "list", "--json"}},
       {"zep media mount", 1, {"media", "mount", "--json", "/dev/no-such-device"}},
@@ -157,6 +160,7 @@ TEST_F(EnvelopeTest, EveryCommandThatSucceedsPrintsADocumentWithItsExitStatus) {
       {"zep classes", 0, {"classes", "--json", "--tree", "--mof", "good.mof"}},
       {"zep plugins", 0, {"plugins", "--json", "--sample"}},
       {"zep mof", 0, {"mof", "--json", "good.mof"}},
+      {"zep plugin new", 0, {"plugin", "new", "--json", "New", "--class", "X_A", "--mof", "good.mof"}},
       {"zep config", 0, {"config", "--json"}},
       {"zep config", 0, {"config", "--json", "a"}},
       {"zep run", 0, {"run", "--json", "echo", "--json=x"}},
@@ -164,9 +168,9 @@ TEST_F(EnvelopeTest, EveryCommandThatSucceedsPrintsADocumentWithItsExitStatus) {
       {"zep help", 0, {"help", "--json", "media", "mount"}},
   };
   for (TRow const& row : rows) Expect(row);
-  std::set<std::string> const elsewhere = {"zep get",         "zep media",        "zep media list",
-                                           "zep media mount", "zep media umount", "zep proxy-check",
-                                           "zep remote",      "zep send",         "zep wpad"};
+  std::set<std::string> const elsewhere = {"zep get",          "zep media",  "zep media list",  "zep media mount",
+                                           "zep media umount", "zep plugin", "zep proxy-check", "zep remote",
+                                           "zep send",         "zep wpad"};
   EXPECT_THAT(Missing(rows, elsewhere), testing::IsEmpty());
 }
 

@@ -1,0 +1,53 @@
+#!/usr/bin/env bash
+# SPDX-License-Identifier: Apache-2.0
+#
+# Installs the build tree given into a fresh prefix, lets the zep there write the project of a plug-in, and does what its README
+# says: builds it without a warning, runs its test, installs it, and looks at its objects.
+#
+#   new-plugin-test.sh BUILD_DIR CXX
+set -euo pipefail
+export LC_ALL=C
+build=$1 cxx=$2
+here=$(cd "$(dirname "$0")" && pwd)
+work=$(realpath "$(mktemp -d)")
+trap 'rm -rf "$work"' EXIT
+cmake --install "$build" --prefix "$work/prefix" >"$work/install.log"
+zep=$work/prefix/bin/zep
+
+fail() {  # fail REASON [FILE]
+  echo "$1" >&2
+  [[ $# == 1 ]] || cat "$2" >&2
+  exit 1
+}
+
+cd "$work"
+"$zep" plugin new Everything --class x_everything --mof "$here/everything.mof" >"$work/new.log" || fail "zep plugin new failed"
+cmake -G Ninja -S Everything -B project -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" \
+  -DCMAKE_CXX_FLAGS="-Wall -Wextra -Wpedantic -Wshadow -Werror" >"$work/log" || fail "it is not configured:" "$work/log"
+cmake --build project >"$work/log" || fail "it is not built:" "$work/log"
+ctest --test-dir project --output-on-failure >"$work/log" || fail "its test fails:" "$work/log"
+grep -q '100% tests passed, 0 tests failed out of 1' "$work/log" || fail "it has no test:" "$work/log"
+
+plugin=project/libEverything.nsp.so
+nm --dynamic --defined-only "$plugin" >"$work/log"
+[[ ! -s $work/log ]] || fail "the plug-in exports symbols:" "$work/log"
+readelf --wide --dynamic "$plugin" | grep -q 'Library runpath: \[\$ORIGIN\]' || fail "the plug-in does not find libzepcore.so beside it"
+
+cmake --install project >"$work/log" || fail "it is not installed:" "$work/log"
+"$zep" report --sample >"$work/log" || true  # an incomplete report is not a failure here
+grep -q 'Everything .*root/everything' "$work/log" || fail "zep report does not list the plug-in:" "$work/log"
+"$zep" show X_Everything >"$work/log" || fail "zep show does not find the class:" "$work/log"
+grep -q '^root/everything:X_Everything\..*CreationClassName="X_Everything"' "$work/log" || fail "zep show lists no object:" "$work/log"
+
+# A key that the author forgets makes the test of the project fail.
+sed -i 's/values.Set("Number", 1);/values.Set("Number", TCIMValue());/' Everything/Everything.cpp
+cmake --build project >"$work/log" || fail "it is not built:" "$work/log"
+! ctest --test-dir project --output-on-failure >"$work/log" || fail "its test passes without a key"
+grep -q 'the key Number is NULL' "$work/log" || fail "its test does not name the key:" "$work/log"
+
+# A change of the MOF file reaches the plug-in.
+sed -i 's/values.Set("Number", TCIMValue());/values.Set("Number", 1);/; s/values.Set("U8", TCIMValue());/values.Set("U9", 9);/' Everything/Everything.cpp
+sed -i 's/uint8 U8;/uint8 U9;/' Everything/Everything.mof
+cmake --build project >"$work/log" || fail "it is not built:" "$work/log"
+ctest --test-dir project --output-on-failure >"$work/log" || fail "its test fails after a change of the MOF file:" "$work/log"
+echo "the project of a new plug-in works"

@@ -1,0 +1,69 @@
+// SPDX-License-Identifier: Apache-2.0
+
+// zep plugin: help for authors of provider plug-ins.
+
+#include "tools/zep/commands/Commands.h"
+#include "tools/zep/output/ExitStatus.h"
+#include "tools/zep/output/Json.h"
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/plugin/NewPlugIn.h"
+#include "tools/zep/plugin/SchemaFile.h"
+#include "tools/zep/secrets/Secrets.h"
+
+#include <CLI/CLI.hpp>
+
+#include <memory>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+struct TArguments {
+  std::string fName;
+  std::string fClass;
+  std::string fMofFile;
+  bool fAsJson = false;
+};
+
+std::string AsText(TNewPlugIn const& made) {
+  return made.fDirectory + "/ has the project of a plug-in for " + made.fClass + ": " + Joined(made.fFiles, ", ") +
+         "\nNext: cd " + made.fDirectory + " && cmake -B build && cmake --build build && ctest --test-dir build\n";
+}
+
+std::string AsJson(TNewPlugIn const& made, std::string const& mofFile) {
+  TJson document = DocumentHead("zep plugin new", kExitComplete, "");
+  document["directory"] = made.fDirectory;
+  document["class"] = made.fClass;
+  document["namespace"] = made.fNamespace;
+  document["schema"] = MessageWithoutSecrets(mofFile);
+  document["files"] = made.fFiles;
+  return zep::AsText(document);
+}
+
+int New(TArguments const& arguments) {
+  std::string const mofFile = arguments.fMofFile.empty() ? SchemaFile() : arguments.fMofFile;
+  TNewPlugIn const made = MakePlugIn(arguments.fName, arguments.fClass, mofFile);
+  WriteMessage(arguments.fAsJson ? AsJson(made, mofFile) : AsText(made));
+  return kExitComplete;
+}
+
+}  // namespace
+
+TRun AddPluginArguments(CLI::App& command) {
+  auto const arguments = std::make_shared<TArguments>();
+  CLI::App* const create = command.add_subcommand("new", "Write the project of a new provider plug-in");
+  create->add_option("name", arguments->fName, "The name of the plug-in and of its new directory")->required();
+  create->add_option("--class", arguments->fClass, "The class of the objects that the plug-in describes")->required();
+  create->add_option("--mof", arguments->fMofFile, "The MOF file that has the class");
+  for (CLI::App* const each : {&command, create}) each->add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  command.require_subcommand(1);
+  create->footer(
+      "The directory has a CMake project: the source of the provider with every property of the class, the class in MOF,\n"
+      "a test and a README. Without --mof the class is searched in the CIM schema of the DMTF: in the directory that\n"
+      "ZEP_DMTF_SCHEMA names, where its archive is unpacked, or in share/zepcore/schema of the installation.\n"
+      "Exit status: 0 when the directory was written, 1 when it was not, 64 for wrong usage.");
+  return [arguments] { return New(*arguments); };
+}
+
+}  // namespace NQRVZEP20::zep
