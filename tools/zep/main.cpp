@@ -37,6 +37,7 @@ constexpr TCommand kCommands[] = {
     {"classes", "List the classes of the providers' namespaces, or of a MOF file", AddClassesArguments},
     {"plugins", "List the plug-ins, and why files are not loaded as plug-ins", AddPluginsArguments},
     {"mof", "Load and check a schema in MOF", AddMofArguments},
+    {"doctor", "Check what works on this host, and name the remedy for what does not", AddDoctorArguments},
     {"plugin", "Write the project of a new provider plug-in", AddPluginArguments},
     {"media", "List, mount and unmount removable media", AddMediaArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},

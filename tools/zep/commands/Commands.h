@@ -30,6 +30,7 @@ constexpr char const* kListMedia = "list";
 
 TRun AddClassesArguments(CLI::App& command);     // ClassesCommand.cpp
 TRun AddConfigArguments(CLI::App& command);      // ConfigCommand.cpp
+TRun AddDoctorArguments(CLI::App& command);      // DoctorCommand.cpp
 TRun AddGetArguments(CLI::App& command);         // GetCommand.cpp
 TRun AddHelpArguments(CLI::App& command);        // HelpCommand.cpp
 TRun AddMediaArguments(CLI::App& command);       // MediaCommand.cpp

@@ -109,6 +109,7 @@ TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
       {"zep classes", 1, {"classes", "--json", "--mof", "/nowhere"}},
       {"zep plugins", 2, {"plugins", "--json", "--plugin", "/nowhere"}},
       {"zep mof", 1, {"mof", "--json", "bad.mof"}},
+      {"zep doctor", 2, {"doctor", "--json"}},
       {"zep plugin", 64, {"plugin", "--json"}},
       {"zep plugin new", 1, {"plugin", "new", "--json", "New", "--class", "X_None", "--mof", "good.mof"}},
       {"zep plugin new", 64, {"plugin", "new", "--json", "not-a-name", "--class", "X_A", "--mof", "good.mof"}},
@@ -168,9 +169,9 @@ TEST_F(EnvelopeTest, EveryCommandThatSucceedsPrintsADocumentWithItsExitStatus) {
       {"zep help", 0, {"help", "--json", "media", "mount"}},
   };
   for (TRow const& row : rows) Expect(row);
-  std::set<std::string> const elsewhere = {"zep get",          "zep media",  "zep media list",  "zep media mount",
-                                           "zep media umount", "zep plugin", "zep proxy-check", "zep remote",
-                                           "zep send",         "zep wpad"};
+  std::set<std::string> const elsewhere = {"zep doctor",      "zep get",          "zep media",  "zep media list",
+                                           "zep media mount", "zep media umount", "zep plugin", "zep proxy-check",
+                                           "zep remote",      "zep send",         "zep wpad"};
   EXPECT_THAT(Missing(rows, elsewhere), testing::IsEmpty());
 }
 

@@ -3,6 +3,7 @@
 // A provider plug-in. The words in the environment variable ZEP_TEST_PROVIDER name its behaviours.
 
 #include "ICIMClass.h"
+#include "TLogger.h"
 #include "TNamespaceProviderManager.h"
 #include "TZEPException.h"
 #include "providers/memory/TMemoryNamespace.h"
@@ -104,6 +105,7 @@ void Fill(TMemoryNamespace& ns) {
   if (Does("throws-a-number")) throw 5;
   if (Does("two-systems") || Does("one-system")) AddSystems(ns);
   if (Does("is-refused")) AddRefused(ns);
+  if (Does("logs-debug")) TLogger::SetLogThreshold(ILogger::kLogDebug);
   if (Does("hard-to-name")) AddHardToName(ns);
   if (Does("odd")) AddOddities(ns);
 }
