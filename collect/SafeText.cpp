@@ -66,4 +66,15 @@ std::string WithBytesEscaped(std::string_view text) {
   return WithEscaped(text, [](TCharacter const& character) { return character.fSize == 0 || character.fCode == 0; });
 }
 
+std::string Shortened(std::string_view text, std::size_t most) {
+  if (text.size() <= most) return std::string(text);
+  auto const isWithin = [](char byte) { return (static_cast<unsigned char>(byte) & 0xc0) == 0x80; };
+  constexpr std::size_t kMostWithin = 3;  // bytes of a character after its first
+  std::size_t const latest = most - 3;
+  std::size_t end = latest;
+  while (end > 0 && latest - end < kMostWithin && isWithin(text[end])) --end;
+  if (isWithin(text[end])) end = latest;  // it is not UTF-8
+  return std::string(text.substr(0, end)) + "...";
+}
+
 }  // namespace NQRVZEP20

@@ -27,4 +27,8 @@ std::string Printable(std::string_view text);
 // "\x00" or "\xff". Other characters remain, including control characters.
 std::string WithBytesEscaped(std::string_view text);
 
+// The text; a longer one than `most` bytes, at least 3, ends in "..." and has at most that many bytes. A UTF-8 character is never
+// cut apart.
+std::string Shortened(std::string_view text, std::size_t most);
+
 }  // namespace NQRVZEP20

@@ -81,15 +81,19 @@ std::string TNamespaceView::PathOf(ICIMInstance const& instance) const {
 // A provider may create a new object at each call. Then the first instance with the same values counts.
 std::size_t TNamespaceView::NumberOf(ICIMInstance const& instance, std::string const& className) const {
   auto const [place, isNew] = fWithoutKeys.try_emplace(className);
-  TInstances& instances = place->second;
+  TNumbered& numbered = place->second;
+  TInstances& instances = numbered.fInstances;
   if (isNew)
     for (auto const& candidate : InstancesOf(className))
-      if (PathIn(*candidate) == className) instances.push_back(candidate);
+      if (PathIn(*candidate) == className) {
+        instances.push_back(candidate);
+        numbered.fNumbers.emplace(candidate.get(), instances.size());
+      }
 
-  auto found = std::find_if(instances.begin(), instances.end(), [&](auto const& other) { return other.get() == &instance; });
-  if (found == instances.end())
-    found = std::find_if(instances.begin(), instances.end(), [&](auto const& other) { return HaveSameValues(*other, instance); });
-  return static_cast<std::size_t>(found - instances.begin()) + 1;
+  auto const number = numbered.fNumbers.find(&instance);
+  if (number != numbered.fNumbers.end()) return number->second;
+  auto const same = [&](auto const& other) { return HaveSameValues(*other, instance); };
+  return static_cast<std::size_t>(std::find_if(instances.begin(), instances.end(), same) - instances.begin()) + 1;
 }
 
 std::string TNamespaceView::SourceOf(ICIMPropertyDecl const& property) const {

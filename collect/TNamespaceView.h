@@ -8,6 +8,7 @@
 
 #include <map>
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 namespace NQRVZEP20 {
@@ -69,8 +70,13 @@ private:
   std::string fSampleLabel;  // empty without a sample
   TReasonReader fReasons;
 
-  // Instances without key values, by class; only for classes for which NumberOf has been called.
-  mutable std::map<std::string, std::vector<boost::shared_ptr<ICIMInstance>>> fWithoutKeys;
+  struct TNumbered {
+    std::vector<boost::shared_ptr<ICIMInstance>> fInstances;
+    std::unordered_map<ICIMInstance const*, std::size_t> fNumbers;  // of the instances, from 1
+  };
+
+  // Instances without key values, by class; only of classes that NumberOf was called for.
+  mutable std::map<std::string, TNumbered> fWithoutKeys;
 };
 
 }  // namespace NQRVZEP20

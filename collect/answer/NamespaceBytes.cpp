@@ -9,6 +9,7 @@
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
 #include "ICIMQualifier.h"
+#include "collect/answer/AnswerLimits.h"
 #include "collect/answer/TBadAnswer.h"
 #include "collect/answer/TByteWriter.h"
 #include "collect/answer/TRecordedFailure.h"
@@ -439,14 +440,18 @@ private:
       return failure->WriteTo(fRecord);
     }
     std::vector<std::size_t> keys;
-    if (IsOfKeys(*path, cls, layout, keys)) {
-      fRecord.Byte(kPathOfKeys);
-      fRecord.Number(keys.size());
-      for (std::size_t const key : keys) fRecord.Number(key);
-    } else {
-      fRecord.Byte(kPathApart);
-      WriteReference(fRecord, *path, fSchema.Numbers());
-    }
+    if (!IsOfKeys(*path, cls, layout, keys)) return WritePathApart(*path);
+    fRecord.Byte(kPathOfKeys);
+    fRecord.Number(keys.size());
+    for (std::size_t const key : keys) fRecord.Number(key);
+  }
+
+  void WritePathApart(TCIMReference const& path) {
+    TByteWriter reference;
+    auto const failure = FailureOfEnumeration([&] { WriteReference(reference, path, fSchema.Numbers()); });
+    fRecord.Byte(failure ? kPathFailed : kPathApart);
+    if (failure) return failure->WriteTo(fRecord);
+    fRecord.Raw(reference.Bytes());
   }
 
   // Whether the path consists of the class and of properties, with exactly their names and values.
@@ -457,7 +462,7 @@ private:
     bool areAll = true;
     path.EnumerateKeyBindings([&](std::pair<std::string, TCIMValue> const& key) {
       auto const position = PositionOf(key.first, layout);
-      areAll = position && HasBytesOf(key.second, *position);
+      areAll = position && keys.size() < kMostKeys && HasBytesOf(key.second, *position);
       if (areAll) keys.push_back(*position);
       return areAll;
     });

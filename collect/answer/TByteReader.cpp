@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/answer/TByteReader.h"
 
+#include "collect/answer/AnswerLimits.h"
 #include "collect/answer/TBadAnswer.h"
 
 #include <algorithm>
@@ -49,6 +50,12 @@ std::string_view TByteReader::Text() {
   std::string_view const text = fBytes.substr(fAt, static_cast<std::size_t>(length));
   fAt += text.size();
   return text;
+}
+
+std::string_view TByteReader::Name() {
+  std::string_view const name = Text();
+  if (name.size() > kLongestName) throw TBadAnswer("a name has more than " + std::to_string(kLongestName) + " bytes");
+  return name;
 }
 
 void TByteReader::Skip(std::size_t bytes) {

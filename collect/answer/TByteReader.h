@@ -39,6 +39,7 @@ public:
   }
 
   std::string_view Text();
+  std::string_view Name();  // a text of at most kLongestName bytes (AnswerLimits.h)
   void Skip(std::size_t bytes);
 
 private:

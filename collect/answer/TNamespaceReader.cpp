@@ -8,6 +8,7 @@
 #include <boost/make_shared.hpp>
 
 #include <limits>
+#include <utility>
 
 namespace NQRVZEP20 {
 
@@ -17,26 +18,27 @@ constexpr std::uint64_t kAnyNumber = std::numeric_limits<unsigned int>::max();
 
 }  // namespace
 
-TNamespaceReader::TNamespaceReader(boost::shared_ptr<TReceivedNamespace> ns)
-    : fNamespace(ns), fNs(*ns), fReader(ns->ReaderAt(0)), fChecker(0) {}
+TNamespaceReader::TNamespaceReader(boost::shared_ptr<TReceivedNamespace> ns, TAnswerCounts& counts)
+    : fNamespace(ns), fNs(*ns), fCounts(counts), fReader(ns->ReaderAt(0)), fChecker(0, counts.fValues) {}
 
 void TNamespaceReader::Read() {
   if (fReader.Text() != kNamespaceForm || fReader.Number() != kNamespaceVersion)
     throw TBadAnswer("it is not a namespace of version " + std::to_string(kNamespaceVersion));
-  fNs.fName = ReadText();
-  fClassCount = fReader.Count(kMostClasses, "the number of classes");
-  fChecker = TValueChecker(fClassCount);
+  fNs.fName = ReadName();
+  fClassCount = fReader.Count(kMostClasses - fCounts.fClasses, "the number of classes");
+  fCounts.fClasses += fClassCount;
+  fChecker = TValueChecker(fClassCount, fCounts.fValues);
   ReadQualifierDecls();
   while (fNs.fClasses.size() < fClassCount) ReadClass();
   fNs.fClassesFailure = ReadEnding();
   for (std::size_t number = 0; number < fClassCount; ++number)
-    if (fNs.fSupers[number] == 0) ReadTree(number);
+    if (fNs.fRoots[number] == number) ReadTree(number);
   if (fReader.Left() != 0) throw TBadAnswer("there are bytes after the end");
 }
 
 void TNamespaceReader::ReadQualifierDecls() {
   for (std::size_t left = CountOf("the number of qualifier declarations"); left > 0; --left) {
-    std::string const name = ReadText();
+    std::string const name = ReadName();
     auto const type = ReadType();
     auto const scope = static_cast<unsigned int>(fReader.NumberUpTo(kAnyNumber, "a scope"));
     auto const flavor = static_cast<unsigned int>(fReader.NumberUpTo(kAnyNumber, "a flavor"));
@@ -48,7 +50,7 @@ void TNamespaceReader::ReadQualifierDecls() {
 TNamespaceReader::TQualifiers TNamespaceReader::ReadQualifiers(boost::weak_ptr<ICIMNamedElement> owner) {
   TQualifiers qualifiers;
   for (std::size_t left = CountOf("the number of qualifiers"); left > 0; --left) {
-    std::string const name = ReadText();
+    std::string const name = ReadName();
     auto const number = static_cast<std::size_t>(fReader.NumberUpTo(fNs.fQualifierDecls.size(), "a qualifier declaration"));
     auto const declaration = number > 0 ? fNs.fQualifierDecls[number - 1] : nullptr;
     auto const flavor = static_cast<unsigned int>(fReader.NumberUpTo(kAnyNumber, "a flavor"));
@@ -60,7 +62,7 @@ TNamespaceReader::TQualifiers TNamespaceReader::ReadQualifiers(boost::weak_ptr<I
 
 void TNamespaceReader::ReadClass() {
   std::size_t const number = fNs.fClasses.size();
-  std::string const name = ReadText();
+  std::string const name = ReadName();
   auto const super = static_cast<std::size_t>(fReader.NumberUpTo(number, "the number of a superclass"));
   std::size_t const depth = super > 0 ? fDepths[super - 1] + 1 : 0;
   if (depth > kMostClassDepth) throw TBadAnswer("the class " + name + " is derived too deeply");
@@ -75,7 +77,9 @@ void TNamespaceReader::ReadClass() {
   auto const cls = boost::make_shared<TReceivedClass>(fNamespace, name, facts);
   if (!fNs.fNumbers.emplace(name, number).second) throw TBadAnswer("there are two classes " + name);
   fNs.fClasses.push_back(cls);
-  fNs.fSupers.push_back(super);
+  fNs.fRoots.push_back(super > 0 ? fNs.fRoots[super - 1] : number);
+  fNs.fChildren.emplace_back();
+  if (super > 0) fNs.fChildren[super - 1].push_back(number);
   fDepths.push_back(depth);
 
   cls->SetQualifiers(ReadQualifiers(cls));
@@ -85,7 +89,7 @@ void TNamespaceReader::ReadClass() {
 }
 
 void TNamespaceReader::ReadPropertyDecl(boost::shared_ptr<TReceivedClass> const& cls) {
-  std::string const name = ReadText();
+  std::string const name = ReadName();
   TReceivedPropertyDecl::TFacts facts;
   facts.fType = ReadType();
   unsigned int const flags = fReader.Byte();
@@ -100,7 +104,7 @@ void TNamespaceReader::ReadPropertyDecl(boost::shared_ptr<TReceivedClass> const&
 
 void TNamespaceReader::ReadStaticProperties(boost::shared_ptr<TReceivedClass> const& cls) {
   for (std::size_t left = CountOf("the number of static properties"); left > 0; --left) {
-    std::string const name = ReadText();
+    std::string const name = ReadName();
     fNs.fStaticProperties.push_back({name, ReadDecl()});
     cls->Add(boost::make_shared<TReceivedProperty>(fNamespace, fNs.fStaticProperties.back(), ReadValuePosition()));
   }
@@ -108,7 +112,7 @@ void TNamespaceReader::ReadStaticProperties(boost::shared_ptr<TReceivedClass> co
 }
 
 void TNamespaceReader::ReadMethod(boost::shared_ptr<TReceivedClass> const& cls) {
-  std::string const name = ReadText();
+  std::string const name = ReadName();
   auto const returnType = ReadType();
   auto const method = boost::make_shared<TReceivedMethodDecl>(fNamespace, name, returnType, cls);
   method->SetQualifiers(ReadQualifiers(method));
@@ -117,11 +121,11 @@ void TNamespaceReader::ReadMethod(boost::shared_ptr<TReceivedClass> const& cls) 
 }
 
 void TNamespaceReader::ReadParameter(boost::shared_ptr<TReceivedMethodDecl> const& method) {
-  std::string const name = ReadText();
+  std::string const name = ReadName();
   TReceivedParameterDecl::TFacts facts;
   facts.fType = ReadType();
   facts.fMaxArraySize = static_cast<unsigned int>(fReader.NumberUpTo(kAnyNumber, "the bound of an array"));
-  facts.fReferencedClassName = ReadText();
+  facts.fReferencedClassName = ReadName();
   facts.fMethod = method;
   auto const parameter = boost::make_shared<TReceivedParameterDecl>(fNamespace, name, facts);
   parameter->SetQualifiers(ReadQualifiers(parameter));
@@ -149,14 +153,15 @@ void TNamespaceReader::ReadLayout() {
   layout.fClassFailure = ReadEnding();
   std::size_t const count = CountOf("the number of properties");
   for (std::size_t n = 0; n < count; ++n) {
-    std::string const name = ReadText();
+    std::string const name = ReadName();
+    layout.fNumbers.emplace(name, n);
     layout.fProperties.push_back({name, ReadDecl()});
   }
   fNs.fLayouts.push_back(std::move(layout));
 }
 
 void TNamespaceReader::ReadInstance() {
-  if (fNs.fInstances.size() == kMostInstances)
+  if (++fCounts.fInstances > kMostInstances)
     throw TBadAnswer("there are more than " + std::to_string(kMostInstances) + " instances");
   std::uint64_t const number = fReader.Number();
   if (number >= fNs.fLayouts.size()) throw TBadAnswer("an instance has a layout that does not exist");
@@ -178,18 +183,29 @@ void TNamespaceReader::ReadPath(TReceivedLayout const& layout) {
   } else if (kind == kPathApart) {
     fChecker.CheckReference(fReader);
   } else if (kind == kPathOfKeys) {
-    for (std::size_t left = fReader.Count(layout.fProperties.size(), "the number of keys"); left > 0; --left)
-      if (fReader.Number() >= layout.fProperties.size()) throw TBadAnswer("a key is not a property");
+    ReadKeys(layout);
   } else {
     throw TBadAnswer("a path has the kind " + std::to_string(kind));
   }
 }
 
-// The elements of this namespace except instances and their values.
+// Each position once: a path reads the value of every key, which may be long.
+void TNamespaceReader::ReadKeys(TReceivedLayout const& layout) {
+  std::size_t const instance = fNs.fInstances.size();
+  if (fKeyOf.size() < layout.fProperties.size()) fKeyOf.resize(layout.fProperties.size(), 0);
+  for (std::size_t left = fReader.Count(kMostKeys, "the number of keys"); left > 0; --left) {
+    std::uint64_t const key = fReader.Number();
+    if (key >= layout.fProperties.size()) throw TBadAnswer("a key is not a property");
+    if (std::exchange(fKeyOf[static_cast<std::size_t>(key)], instance) == instance) throw TBadAnswer("a path has a key twice");
+  }
+}
+
+// The elements except instances and their values.
 std::size_t TNamespaceReader::CountOf(char const* what) {
   std::size_t const count = fReader.Count(kMostElements, what);
-  fElements += count + 1;
-  if (fElements > kMostElementsInAll) throw TBadAnswer("there are more than " + std::to_string(kMostElementsInAll) + " elements");
+  fCounts.fElements += count + 1;
+  if (fCounts.fElements > kMostElementsInAll)
+    throw TBadAnswer("there are more than " + std::to_string(kMostElementsInAll) + " elements");
   return count;
 }
 

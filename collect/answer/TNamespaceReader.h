@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "collect/answer/AnswerLimits.h"
 #include "collect/answer/TReceivedNamespace.h"
 
 namespace NQRVZEP20 {
@@ -8,7 +9,8 @@ namespace NQRVZEP20 {
 // Validates the bytes of a received namespace and creates its elements.
 class TNamespaceReader {
 public:
-  explicit TNamespaceReader(boost::shared_ptr<TReceivedNamespace> ns);
+  // `counts`, which outlives the reader, is that of the plug-in.
+  TNamespaceReader(boost::shared_ptr<TReceivedNamespace> ns, TAnswerCounts& counts);
 
   void Read();  // throws TBadAnswer
 
@@ -26,8 +28,9 @@ private:
   void ReadLayout();
   void ReadInstance();
   void ReadPath(TReceivedLayout const& layout);
+  void ReadKeys(TReceivedLayout const& layout);
 
-  std::string ReadText() { return std::string(fReader.Text()); }
+  std::string ReadName() { return std::string(fReader.Name()); }
   std::size_t CountOf(char const* what);
   TCIMValue::TCIMType ReadType();
   std::size_t ReadValuePosition();  // checks the value
@@ -36,11 +39,12 @@ private:
 
   boost::shared_ptr<TReceivedNamespace> const fNamespace;
   TReceivedNamespace& fNs;
+  TAnswerCounts& fCounts;
   TByteReader fReader;
   std::size_t fClassCount = 0;
   TValueChecker fChecker;
-  std::vector<std::size_t> fDepths;  // the number of superclasses, by class
-  std::size_t fElements = 0;         // the sum of all results of CountOf
+  std::vector<std::size_t> fDepths;  // of the classes
+  std::vector<std::size_t> fKeyOf;   // by property of the layout: the last instance whose path has it as a key, from 1
 };
 
 }  // namespace NQRVZEP20

@@ -68,9 +68,13 @@ void TReceivedClass::EnumerateMethodDecls(boost::function<bool(boost::shared_ptr
 }
 
 boost::shared_ptr<TReceivedPropertyDecl> TReceivedClass::FindPropertyDecl(std::string const& name) const {
-  for (auto const& property : fPropertyDecls)
-    if (IsSameName(property->Name(), name)) return property;
-  return {};
+  auto const found = fNumbers.find(name);
+  return found != fNumbers.end() ? fPropertyDecls[found->second] : boost::shared_ptr<TReceivedPropertyDecl>();
+}
+
+void TReceivedClass::Add(boost::shared_ptr<TReceivedPropertyDecl> property) {
+  fNumbers.emplace(property->Name(), fPropertyDecls.size());
+  fPropertyDecls.push_back(std::move(property));
 }
 
 }  // namespace NQRVZEP20

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "CIMNames.h"
 #include "ICIMClass.h"
 #include "collect/answer/TReceivedElement.h"
 #include "collect/answer/TReceivedMethodDecl.h"
@@ -8,6 +9,9 @@
 #include "collect/answer/TReceivedPropertyDecl.h"
 
 #include <optional>
+#include <string>
+#include <unordered_map>
+#include <vector>
 
 namespace NQRVZEP20 {
 
@@ -53,8 +57,8 @@ public:
 
   TFacts const& Facts() const { return fFacts; }
   std::vector<boost::shared_ptr<TReceivedPropertyDecl>> const& PropertyDecls() const { return fPropertyDecls; }
-  boost::shared_ptr<TReceivedPropertyDecl> FindPropertyDecl(std::string const& name) const;  // its own; empty if there is none
-  void Add(boost::shared_ptr<TReceivedPropertyDecl> property) { fPropertyDecls.push_back(property); }
+  boost::shared_ptr<TReceivedPropertyDecl> FindPropertyDecl(std::string const& name) const;  // its own; empty when there is none
+  void Add(boost::shared_ptr<TReceivedPropertyDecl> property);
   void Add(boost::shared_ptr<TReceivedMethodDecl> method) { fMethodDecls.push_back(method); }
   void Add(boost::shared_ptr<TReceivedProperty> staticProperty) { fStaticProperties.push_back(staticProperty); }
   void EndStaticPropertiesWith(TRecordedFailure failure) { fStaticFailure = std::move(failure); }
@@ -62,6 +66,8 @@ public:
 private:
   TFacts const fFacts;
   std::vector<boost::shared_ptr<TReceivedPropertyDecl>> fPropertyDecls;
+  std::unordered_map<std::string, std::size_t, TNameHash, TNameEqual>
+      fNumbers;  // of the declarations; of two with one name the first
   std::vector<boost::shared_ptr<TReceivedMethodDecl>> fMethodDecls;
   std::vector<boost::shared_ptr<TReceivedProperty>> fStaticProperties;
   std::optional<TRecordedFailure> fStaticFailure;  // thrown after the static properties

@@ -32,12 +32,10 @@ boost::shared_ptr<ICIMClass> TReceivedInstance::GetClass(TCIMContext const&) con
 
 boost::shared_ptr<ICIMProperty> TReceivedInstance::GetProperty(std::string const& name, TCIMContext const&) const {
   boost::shared_ptr<TReceivedNamespace> const ns(fNamespace);
-  TByteReader reader = ns->ReaderAt(fAt);
-  for (TReceivedPropertyName const& property : fLayout->fProperties) {
-    if (IsSameName(property.fName, name)) return boost::make_shared<TReceivedProperty>(ns, property, reader.At());
-    SkipProperty(reader);
-  }
-  return {};
+  auto const found = fLayout->fNumbers.find(name);
+  if (found == fLayout->fNumbers.end()) return {};
+  std::size_t const number = found->second;
+  return boost::make_shared<TReceivedProperty>(ns, fLayout->fProperties[number], ns->PositionsOf(*this)[number]);
 }
 
 void TReceivedInstance::EnumerateProperties(boost::function<bool(boost::shared_ptr<ICIMProperty>)> callback,
@@ -52,13 +50,8 @@ void TReceivedInstance::EnumerateProperties(boost::function<bool(boost::shared_p
 
 TCIMReference TReceivedInstance::GetPath(TCIMContext const&) const {
   boost::shared_ptr<TReceivedNamespace> const ns(fNamespace);
-  TByteReader reader = ns->ReaderAt(fAt);
-  std::vector<std::size_t> positions;  // of the property values
-  for (std::size_t n = 0; n < fLayout->fProperties.size(); ++n) {
-    positions.push_back(reader.At());
-    SkipProperty(reader);
-  }
-
+  std::vector<std::size_t> const& positions = ns->PositionsOf(*this);
+  TByteReader reader = ns->ReaderAt(positions.back());
   unsigned int const kind = reader.Byte();
   if (kind == kPathFailed) TRecordedFailure::ReadFrom(reader).Throw();
   if (kind == kPathApart) return ReadReference(reader, *ns);
@@ -69,6 +62,16 @@ TCIMReference TReceivedInstance::GetPath(TCIMContext const&) const {
     path.AddKeyValue(fLayout->fProperties[key].fName, ns->ValueAt(positions[key]));
   }
   return path;
+}
+
+std::vector<std::size_t> TReceivedInstance::PositionsIn(TReceivedNamespace const& ns) const {
+  std::vector<std::size_t> positions = {fAt};
+  TByteReader reader = ns.ReaderAt(fAt);
+  for (std::size_t left = fLayout->fProperties.size(); left > 0; --left) {
+    SkipProperty(reader);
+    positions.push_back(reader.At());
+  }
+  return positions;
 }
 
 }  // namespace NQRVZEP20

@@ -5,6 +5,9 @@
 
 #include <boost/weak_ptr.hpp>
 
+#include <cstddef>
+#include <vector>
+
 namespace NQRVZEP20 {
 
 class TReceivedNamespace;
@@ -24,7 +27,11 @@ public:
                            TCIMContext const& context) const override;
   TCIMReference GetPath(TCIMContext const& context) const override;
 
-  TReceivedLayout const& Layout() const { return *fLayout; }  // valid as long as the namespace exists
+  TReceivedLayout const& Layout() const { return *fLayout; }  // as long as the namespace exists
+  std::size_t At() const { return fAt; }
+
+  // The position of each value, and of the path after them.
+  std::vector<std::size_t> PositionsIn(TReceivedNamespace const& ns) const;
 
 private:
   boost::weak_ptr<TReceivedNamespace> const fNamespace;

@@ -7,14 +7,21 @@
 
 #include <boost/make_shared.hpp>
 
+#include <algorithm>
+
 namespace NQRVZEP20 {
 
 void RefuseChange() { throw TZEPException(kZEPStatusNotSupported); }
 
-boost::shared_ptr<TReceivedNamespace> TReceivedNamespace::From(std::string bytes) {
+boost::shared_ptr<TReceivedNamespace> TReceivedNamespace::From(std::string bytes, TAnswerCounts& counts) {
   boost::shared_ptr<TReceivedNamespace> const ns(new TReceivedNamespace(std::move(bytes)));
-  TNamespaceReader(ns).Read();
+  TNamespaceReader(ns, counts).Read();
   return ns;
+}
+
+boost::shared_ptr<TReceivedNamespace> TReceivedNamespace::From(std::string bytes) {
+  TAnswerCounts counts;
+  return From(std::move(bytes), counts);
 }
 
 std::string TReceivedNamespace::GetName(TCIMContext const&) const { return fName; }
@@ -72,24 +79,36 @@ TCIMValue TReceivedNamespace::ValueAt(std::size_t at) const {
 }
 
 std::vector<boost::shared_ptr<TReceivedClass>> TReceivedNamespace::ClassesBelow(std::size_t number) const {
-  std::vector<bool> const isInTree = IsInTreeOf(number);
   std::vector<boost::shared_ptr<TReceivedClass>> classes;
-  for (std::size_t cls = number + 1; cls < fClasses.size(); ++cls)
-    if (isInTree[cls]) classes.push_back(fClasses[cls]);
+  for (std::size_t const cls : TreeOf(number))
+    if (cls != number) classes.push_back(fClasses[cls]);
   return classes;
 }
 
 // The instances of a tree are in the order in which the provider enumerates those of its root class.
 void TReceivedNamespace::VisitInstances(std::size_t cls,
                                         boost::function<bool(boost::shared_ptr<ICIMInstance>)> const& callback) const {
-  std::size_t const root = RootOf(cls);
-  TTree const& tree = fTrees.at(root);
-  std::vector<bool> const isWanted = cls == root ? std::vector<bool>() : IsInTreeOf(cls);
-  for (std::size_t n = tree.fBegin; n < tree.fEnd; ++n) {
-    bool const isVisited = cls == root || isWanted[fInstances[n]->Layout().fClass];
-    if (isVisited && !callback(fInstances[n])) return;
+  TTree const& tree = fTrees.at(fRoots[cls]);
+  if (cls == fRoots[cls]) {
+    for (std::size_t n = tree.fBegin; n < tree.fEnd; ++n)
+      if (!callback(fInstances[n])) return;
+  } else {
+    std::vector<std::size_t> wanted;
+    for (std::size_t const below : TreeOf(cls)) wanted.insert(wanted.end(), InstancesOf(below).begin(), InstancesOf(below).end());
+    std::sort(wanted.begin(), wanted.end());
+    for (std::size_t const n : wanted)
+      if (!callback(fInstances[n])) return;
   }
   if (tree.fFailure) tree.fFailure->Throw();
+}
+
+// Most readers ask one instance for all that they want, and then the next one.
+std::vector<std::size_t> const& TReceivedNamespace::PositionsOf(TReceivedInstance const& instance) const {
+  if (fPositionsAt != instance.At()) {
+    fPositions = instance.PositionsIn(*this);
+    fPositionsAt = instance.At();
+  }
+  return fPositions;
 }
 
 boost::shared_ptr<ICIMNamespace> TReceivedNamespace::Namespace() const {
@@ -124,24 +143,32 @@ void TReceivedNamespace::DeclareOutside(boost::shared_ptr<ICIMClass> const& cls,
 TReceivedNamespace::TByKeys const& TReceivedNamespace::InstancesByKeys(std::size_t cls) const {
   auto const [place, isNew] = fByKeys.try_emplace(cls);
   if (!isNew) return place->second;
-  TTree const& tree = fTrees.at(RootOf(cls));
-  for (std::size_t n = tree.fBegin; n < tree.fEnd; ++n)
-    if (fInstances[n]->Layout().fClass == cls)
-      place->second.emplace(KeyText(fInstances[n]->GetPath(TCIMContext())), fInstances[n]);
+  for (std::size_t const n : InstancesOf(cls))
+    place->second.emplace(KeyText(fInstances[n]->GetPath(TCIMContext())), fInstances[n]);
   return place->second;
 }
 
-std::size_t TReceivedNamespace::RootOf(std::size_t cls) const {
-  while (fSupers[cls] != 0) cls = fSupers[cls] - 1;
-  return cls;
+std::vector<std::size_t> TReceivedNamespace::TreeOf(std::size_t cls) const {
+  std::vector<std::size_t> tree = {cls};
+  for (std::size_t at = 0; at < tree.size(); ++at) {
+    auto const& children = fChildren[tree[at]];
+    tree.insert(tree.end(), children.begin(), children.end());
+  }
+  std::sort(tree.begin(), tree.end());
+  return tree;
 }
 
-// A class comes after its superclass.
-std::vector<bool> TReceivedNamespace::IsInTreeOf(std::size_t cls) const {
-  std::vector<bool> isInTree(fClasses.size(), false);
-  isInTree[cls] = true;
-  for (std::size_t n = cls + 1; n < fClasses.size(); ++n) isInTree[n] = fSupers[n] != 0 && isInTree[fSupers[n] - 1];
-  return isInTree;
+// Made when it is first needed: most readers visit the instances of root classes.
+std::vector<std::size_t> const& TReceivedNamespace::InstancesOf(std::size_t cls) const {
+  if (fInstancesOf.empty()) {
+    fInstancesOf.resize(fClasses.size());
+    for (auto const& [root, tree] : fTrees)
+      for (std::size_t n = tree.fBegin; n < tree.fEnd; ++n) {
+        std::size_t const own = fInstances[n]->Layout().fClass;
+        if (fRoots[own] == root) fInstancesOf[own].push_back(n);
+      }
+  }
+  return fInstancesOf[cls];
 }
 
 }  // namespace NQRVZEP20

@@ -3,6 +3,7 @@
 
 #include "CIMNames.h"
 #include "ICIMNamespace.h"
+#include "collect/answer/AnswerLimits.h"
 #include "collect/answer/TByteReader.h"
 #include "collect/answer/TReceivedClass.h"
 #include "collect/answer/TReceivedInstance.h"
@@ -30,8 +31,10 @@ class TReceivedNamespace : public ICIMNamespace,
                            public TReadingNamespace,
                            public boost::enable_shared_from_this<TReceivedNamespace> {
 public:
-  // Throws TBadAnswer if the bytes are not a serialised namespace or exceed the limits (AnswerLimits.h).
-  static boost::shared_ptr<TReceivedNamespace> From(std::string bytes);
+  // Throws TBadAnswer for bytes that are not a namespace, or exceed the limits (AnswerLimits.h) together with those that `counts`
+  // counts already.
+  static boost::shared_ptr<TReceivedNamespace> From(std::string bytes, TAnswerCounts& counts);
+  static boost::shared_ptr<TReceivedNamespace> From(std::string bytes);  // of a plug-in without other namespaces
 
   std::string GetName(TCIMContext const& context) const override;
   boost::shared_ptr<ICIMClass> CreateClass(boost::shared_ptr<ICIMClass> superClass, std::string const& name,
@@ -51,6 +54,9 @@ public:
   TCIMValue ValueAt(std::size_t at) const;  // throws the recorded failure if there is no value
   TByteReader ReaderAt(std::size_t at) const { return TByteReader(fBytes, at); }
   std::vector<boost::shared_ptr<TReceivedClass>> ClassesBelow(std::size_t number) const;
+
+  // The positions of the values of an instance, and of its path after them; valid until the next call.
+  std::vector<std::size_t> const& PositionsOf(TReceivedInstance const& instance) const;
   void VisitInstances(std::size_t cls, boost::function<bool(boost::shared_ptr<ICIMInstance>)> const& callback) const;
 
   boost::shared_ptr<ICIMNamespace> Namespace() const override;
@@ -70,15 +76,16 @@ private:
   using TByKeys = std::unordered_map<std::string, boost::shared_ptr<TReceivedInstance>>;  // by KeyText of their paths
 
   explicit TReceivedNamespace(std::string bytes) : fBytes(std::move(bytes)) {}
-  TByKeys const& InstancesByKeys(std::size_t cls) const;  // only those of exactly that class
-  std::size_t RootOf(std::size_t cls) const;
-  std::vector<bool> IsInTreeOf(std::size_t cls) const;  // by class
+  TByKeys const& InstancesByKeys(std::size_t cls) const;               // of exactly that class
+  std::vector<std::size_t> TreeOf(std::size_t cls) const;              // the class and those below it, in their order
+  std::vector<std::size_t> const& InstancesOf(std::size_t cls) const;  // of exactly that class, in the tree of its root
 
   std::string const fBytes;
   std::string fName;
   std::vector<boost::shared_ptr<TReceivedQualifierDecl>> fQualifierDecls;
   std::vector<boost::shared_ptr<TReceivedClass>> fClasses;
-  std::vector<std::size_t> fSupers;  // by class: the index of the superclass plus 1, or 0
+  std::vector<std::size_t> fRoots;                  // by class
+  std::vector<std::vector<std::size_t>> fChildren;  // the same
   std::unordered_map<std::string, std::size_t, TNameHash, TNameEqual> fNumbers;
   std::optional<TRecordedFailure> fClassesFailure;
   std::deque<TReceivedPropertyName> fStaticProperties;  // of all classes; a deque, so that addresses are stable
@@ -86,7 +93,10 @@ private:
   std::vector<boost::shared_ptr<TReceivedInstance>> fInstances;
   std::map<std::size_t, TTree> fTrees;  // by the number of the root class
 
-  mutable std::map<std::size_t, TByKeys> fByKeys;                             // by class; filled on the first search
+  mutable std::vector<std::vector<std::size_t>> fInstancesOf;                 // by class; empty until it is needed
+  mutable std::size_t fPositionsAt = std::string::npos;                       // of the instance that fPositions is about
+  mutable std::vector<std::size_t> fPositions;                                // see PositionsOf
+  mutable std::map<std::size_t, TByKeys> fByKeys;                             // by class; of those that were searched
   mutable std::map<std::string, boost::shared_ptr<TReceivedClass>> fOutside;  // by lower-case name
 };
 

@@ -2,6 +2,8 @@
 #include "collect/answer/TRecordedFailure.h"
 
 #include "TZEPFailure.h"
+#include "collect/SafeText.h"
+#include "collect/answer/AnswerLimits.h"
 #include "collect/answer/TBadAnswer.h"
 #include "collect/answer/TByteReader.h"
 #include "collect/answer/TByteWriter.h"
@@ -44,7 +46,7 @@ TRecordedFailure TRecordedFailure::ReadFrom(TByteReader& reader) {
   recorded.fKind = static_cast<EKind>(reader.NumberUpTo(kOther, "the kind of a failure"));
   // The texts of the codes are in a table.
   recorded.fCode = static_cast<int>(reader.NumberUpTo(fdrStatusEnd, "a status code"));
-  recorded.fText = reader.Text();
+  recorded.fText = Shortened(reader.Text(), kLongestFailure);
   return recorded;
 }
 

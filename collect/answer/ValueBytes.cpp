@@ -78,9 +78,9 @@ void WriteNestedReference(TByteWriter& writer, TCIMReference const& reference, T
   TByteWriter keys;
   std::uint64_t count = 0;
   reference.EnumerateKeyBindings([&](std::pair<std::string, TCIMValue> const& key) {
+    if (++count > kMostKeys) throw TBadAnswer("a path has more than " + std::to_string(kMostKeys) + " keys");
     keys.Text(key.first);
     WriteNested(keys, key.second, classes, depth + 1);
-    ++count;
     return true;
   });
   writer.Byte(reference.GetNamespace() ? kHasNamespace : 0);
@@ -237,7 +237,7 @@ bool IsMissingValue(TByteReader& reader) {
 
 void TValueChecker::CheckClass(TByteReader& reader) const {
   std::uint64_t const number = reader.Number();
-  if (number == 1) reader.Text();
+  if (number == 1) reader.Name();
   if (number > 1 && number - 2 >= fClasses) throw TBadAnswer("a value refers to a class that does not exist");
 }
 
@@ -245,11 +245,11 @@ void TValueChecker::CheckReference(TByteReader& reader, std::uint64_t depth) {
   reader.Byte();
   TByteReader const atClass = reader;
   CheckClass(reader);
-  reader.Text();
-  std::size_t const keys = reader.Count(kMostElements, "the number of keys");
+  reader.Text();  // the label
+  std::size_t const keys = reader.Count(kMostKeys, "the number of keys");
   if (keys > 0 && TByteReader(atClass).Number() == 0) throw TBadAnswer("a reference has keys, but no class");
   for (std::size_t n = 0; n < keys; ++n) {
-    reader.Text();
+    reader.Name();
     CheckValue(reader, depth + 1);
   }
 }
@@ -277,14 +277,17 @@ void TValueChecker::CheckData(TByteReader& reader, unsigned int type, std::uint6
 
 void TValueChecker::CheckValue(TByteReader& reader, std::uint64_t depth) {
   if (depth > kMostReferenceDepth) throw TBadAnswer("a value is nested too deeply");
-  if (++fValues > kMostValues) throw TBadAnswer("there are more than " + std::to_string(kMostValues) + " values");
+  if (++*fValues > kMostValues) throw TBadAnswer("there are more than " + std::to_string(kMostValues) + " values");
   TTag const tag = ReadTag(reader);
   if (!tag.fIsNull) return CheckData(reader, tag.fType, depth);
   if (IsArrayTag(tag.fType)) reader.NumberUpTo(std::numeric_limits<unsigned int>::max(), "the bound of an array");
   if (tag.fType == TType::kCIMTypeReference) CheckClass(reader);
 }
 
-void SkipValue(TByteReader& reader) { TValueChecker(std::numeric_limits<std::size_t>::max()).CheckValue(reader); }
+void SkipValue(TByteReader& reader) {
+  std::uint64_t values = 0;
+  TValueChecker(std::numeric_limits<std::size_t>::max(), values).CheckValue(reader);
+}
 
 TCIMReference ReadReference(TByteReader& reader, TReadingNamespace const& ns) {
   bool const hasNamespace = (reader.Byte() & kHasNamespace) != 0;

@@ -18,7 +18,7 @@ namespace NQRVZEP20 {
 
 using TClassNumbers = std::map<std::string, std::size_t>;  // by lower-case name
 
-// Both throw TBadAnswer for references that are nested too deeply (AnswerLimits.h).
+// Throws TBadAnswer for references that are nested too deeply or have too many keys (AnswerLimits.h).
 void WriteValue(TByteWriter& writer, TCIMValue const& value, TClassNumbers const& classes);
 void WriteReference(TByteWriter& writer, TCIMReference const& reference, TClassNumbers const& classes);
 
@@ -26,10 +26,11 @@ void WriteReference(TByteWriter& writer, TCIMReference const& reference, TClassN
 void WriteMissingValue(TByteWriter& writer);
 bool IsMissingValue(TByteReader& reader);  // reads the mark, if there is one
 
-// Validates the next value and skips it. Counts the values. Throws TBadAnswer if the value is malformed or exceeds a limit.
+// Checks the form of the value that follows, and skips it. `values`, which outlives the checker, counts the values. Throws
+// TBadAnswer.
 class TValueChecker {
 public:
-  explicit TValueChecker(std::size_t classes) : fClasses(classes) {}
+  TValueChecker(std::size_t classes, std::uint64_t& values) : fClasses(classes), fValues(&values) {}
   void CheckValue(TByteReader& reader, std::uint64_t depth = 0);
   void CheckReference(TByteReader& reader, std::uint64_t depth = 0);
 
@@ -38,7 +39,7 @@ private:
   void CheckData(TByteReader& reader, unsigned int type, std::uint64_t depth);
 
   std::size_t fClasses;
-  std::uint64_t fValues = 0;
+  std::uint64_t* fValues;
 };
 
 // Skips a value that has been validated.

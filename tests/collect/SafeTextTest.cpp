@@ -71,5 +71,21 @@ TEST(SafeTextTest, TheFirstCharacterHasItsCodeAndSize) {
             0u);
 }
 
+TEST(SafeTextTest, ALongTextIsShortenedBetweenCharacters) {
+  struct TRow {
+    std::string fText, fShortened;  // to 10 bytes
+  } const rows[] = {
+      {"", ""},
+      {"ten bytes.", "ten bytes."},
+      {"eleven byte", "eleven ..."},
+      {"sixsix\xc3\xa9 and more", "sixsix..."},
+      {"fivef\xe2\x82\xac and more", "fivef..."},
+      {"four\xf0\x9f\x98\x80 and more", "four..."},
+      {"seven77\xc3\xa9 and more", "seven77..."},
+      {std::string(11, '\x80'), std::string(7, '\x80') + "..."},  // not UTF-8
+  };
+  for (TRow const& row : rows) EXPECT_EQ(Shortened(row.fText, 10), row.fShortened) << row.fText;
+}
+
 }  // namespace
 }  // namespace NQRVZEP20

@@ -7,9 +7,12 @@
 #include "TMemoryInstance.h"
 #include "TMemoryNamespace.h"
 #include "TRecordWriter.h"
+#include "tests/Support.h"
 
 #include <gtest/gtest.h>
 #include <boost/make_shared.hpp>
+
+#include <ctime>
 
 namespace NQRVZEP20 {
 namespace {
@@ -102,6 +105,21 @@ TEST_F(TNamespaceViewTest, AClassThatIsMissingHasNoInstances) {
   EXPECT_FALSE(View().FindClass("X_None"));
   EXPECT_TRUE(View().InstancesOf("X_None").empty());
   EXPECT_EQ(View().AllInstances().size(), 4u);  // two disks, and two reasons
+}
+
+// This takes minutes when each one is searched among all.
+TEST(TNamespaceViewPathsTest, ManyInstancesWithoutKeysAreNumberedSoon) {
+  constexpr std::size_t kCount = kIsSanitized ? 20'000 : 200'000;
+  auto const ns = boost::make_shared<TMemoryNamespace>("root/plain");
+  ns->DefineClass("X_Plain").Property("Text", "string");
+  for (std::size_t n = 0; n < kCount; ++n) ns->AddInstance("X_Plain", {});
+  std::clock_t const begin = std::clock();
+  TNamespaceView const view("Plain", ns);
+  std::size_t number = 0;
+  for (auto const& instance : view.AllInstances())
+    ASSERT_EQ(view.PathOf(*instance), "root/plain:X_Plain#" + std::to_string(++number));
+  EXPECT_EQ(number, kCount);
+  EXPECT_LT((std::clock() - begin) / CLOCKS_PER_SEC, 8);
 }
 
 }  // namespace

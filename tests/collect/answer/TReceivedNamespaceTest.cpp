@@ -5,6 +5,8 @@
 #include "ICIMMethodDecl.h"
 #include "ICIMParameterDecl.h"
 #include "ICIMProperty.h"
+#include "collect/ClassTree.h"
+#include "collect/TNamespaceView.h"
 #include "collect/answer/AnswerLimits.h"
 #include "collect/answer/TBadAnswer.h"
 #include "tests/Support.h"
@@ -15,6 +17,7 @@
 
 #include <boost/make_shared.hpp>
 
+#include <ctime>
 #include <random>
 
 namespace NQRVZEP20 {
@@ -153,24 +156,217 @@ TEST(TReceivedNamespaceTest, AnotherVersionIsRefused) {
   EXPECT_EQ(WhyRefused(writer.Bytes()), "it is not a namespace of version 1");
 }
 
-// A chain of classes without elements, each below the one before.
+// A class without elements. `super` is the number of its superclass plus 1, or 0.
+void WriteClass(TByteWriter& writer, std::string const& name, std::size_t super) {
+  writer.Text(name);
+  writer.Number(super);
+  for (int nothing = 0; nothing < 6; ++nothing) writer.Byte(0);  // flags, qualifiers, properties, two of statics, methods
+}
+
+void WriteEndOfTree(TByteWriter& writer) {
+  writer.Number(kEnd);
+  writer.Byte(0);
+}
+
+// A chain of classes, each below the one before.
 std::string ChainOfClasses(std::size_t length) {
   TByteWriter writer;
   writer.Number(0);  // qualifier declarations
-  for (std::size_t number = 0; number < length; ++number) {
-    writer.Text("X" + std::to_string(number));
-    writer.Number(number);
-    for (int nothing = 0; nothing < 6; ++nothing) writer.Byte(0);  // flags, qualifiers, properties, two of statics, methods
-  }
-  writer.Byte(0);       // the ending of the classes
-  writer.Number(kEnd);  // of the instances
-  writer.Byte(0);       // their ending
+  for (std::size_t number = 0; number < length; ++number) WriteClass(writer, "X" + std::to_string(number), number);
+  writer.Byte(0);  // the ending of the classes
+  WriteEndOfTree(writer);
   return Head(length) + writer.Bytes();
+}
+
+// A class X_Item with one instance of these properties, and the path that follows.
+std::string OneInstance(std::vector<std::pair<std::string, TCIMValue>> const& properties, std::string const& path) {
+  TByteWriter writer;
+  writer.Number(0);
+  WriteClass(writer, "X_Item", 0);
+  writer.Byte(0);
+  writer.Number(kLayout);
+  writer.Number(0);  // the class
+  writer.Byte(0);    // it did not fail
+  writer.Number(properties.size());
+  for (auto const& [name, value] : properties) {
+    writer.Text(name);
+    writer.Number(0);  // without a declaration
+  }
+  writer.Number(kInstance);
+  writer.Number(0);  // the layout
+  for (auto const& [name, value] : properties) WriteValue(writer, value, {});
+  writer.Raw(path);
+  WriteEndOfTree(writer);
+  return Head(1) + writer.Bytes();
+}
+
+std::string PathOfKeys(std::vector<std::uint64_t> const& positions) {
+  TByteWriter writer;
+  writer.Number(kPathOfKeys);
+  writer.Number(positions.size());
+  for (std::uint64_t const position : positions) writer.Number(position);
+  return writer.Bytes();
 }
 
 TEST(TReceivedNamespaceTest, ClassesThatAreDerivedTooDeeplyAreRefused) {
   EXPECT_EQ(WhyRefused(ChainOfClasses(kMostClassDepth + 1)), "");
-  EXPECT_EQ(WhyRefused(ChainOfClasses(kMostClassDepth + 2)), "the class X1001 is derived too deeply");
+  EXPECT_EQ(WhyRefused(ChainOfClasses(kMostClassDepth + 2)), "the class X101 is derived too deeply");
+}
+
+TEST(TReceivedNamespaceTest, APathThatHasAKeyTwiceIsRefused) {
+  EXPECT_EQ(WhyRefused(OneInstance({{"Id", 1}, {"Text", "x"}}, PathOfKeys({0, 1}))), "");
+  EXPECT_EQ(WhyRefused(OneInstance({{"Id", 1}, {"Text", "x"}}, PathOfKeys({1, 1}))), "a path has a key twice");
+  EXPECT_EQ(WhyRefused(OneInstance({{"Id", 1}}, PathOfKeys({1}))), "a key is not a property");
+}
+
+TEST(TReceivedNamespaceTest, APathWithTooManyKeysIsRefused) {
+  std::vector<std::pair<std::string, TCIMValue>> properties;
+  std::vector<std::uint64_t> positions;
+  for (std::size_t n = 0; n < kMostKeys; ++n) {
+    properties.emplace_back("P" + std::to_string(n), 1);
+    positions.push_back(n);
+  }
+  EXPECT_EQ(WhyRefused(OneInstance(properties, PathOfKeys(positions))), "");
+  properties.emplace_back("More", 1);
+  positions.push_back(kMostKeys);
+  EXPECT_EQ(WhyRefused(OneInstance(properties, PathOfKeys(positions))), "the number of keys: 257, more than 256");
+}
+
+TEST(TReceivedNamespaceTest, ALongNameIsRefused) {
+  EXPECT_EQ(WhyRefused(OneInstance({{std::string(kLongestName, 'P'), 1}}, PathOfKeys({0}))), "");
+  EXPECT_EQ(WhyRefused(OneInstance({{std::string(kLongestName + 1, 'P'), 1}}, PathOfKeys({0}))),
+            "a name has more than 1024 bytes");
+}
+
+TEST(TReceivedNamespaceTest, AnInstanceWithTooManyPropertiesIsRefused) {
+  std::vector<std::pair<std::string, TCIMValue>> properties;
+  while (properties.size() <= kMostElements) properties.emplace_back("P" + std::to_string(properties.size()), 1);
+  EXPECT_EQ(WhyRefused(OneInstance(properties, PathOfKeys({0}))), "the number of properties: 10001, more than 10000");
+}
+
+TEST(TReceivedNamespaceTest, TheNamespacesOfAPlugInAreCountedTogether) {
+  std::string const bytes = OneInstance({{"Id", 1}}, PathOfKeys({0}));
+  TAnswerCounts one;
+  TReceivedNamespace::From(bytes, one);
+  EXPECT_EQ(one.fClasses, 1u);
+  EXPECT_EQ(one.fInstances, 1u);
+  EXPECT_EQ(one.fValues, 1u);
+  EXPECT_GT(one.fElements, 0u);
+
+  struct TRow {
+    std::uint64_t TAnswerCounts::*fCount;
+    std::uint64_t fMost;
+    char const* fWhy;
+  } const rows[] = {
+      {&TAnswerCounts::fClasses, kMostClasses, "the number of classes: 1, more than 0"},
+      {&TAnswerCounts::fElements, kMostElementsInAll, "there are more than 2000000 elements"},
+      {&TAnswerCounts::fInstances, kMostInstances, "there are more than 2000000 instances"},
+      {&TAnswerCounts::fValues, kMostValues, "there are more than 50000000 values"},
+  };
+  for (TRow const& row : rows) {
+    TAnswerCounts counts;
+    counts.*row.fCount = row.fMost;
+    try {
+      TReceivedNamespace::From(bytes, counts);
+      ADD_FAILURE() << row.fWhy;
+    } catch (TBadAnswer const& refusal) {
+      EXPECT_STREQ(refusal.what(), row.fWhy);
+    }
+  }
+}
+
+// ---- Work in proportion to the bytes: each of these takes minutes when it is quadratic ----
+
+template <class TWork>
+void ExpectSoon(TWork work) {
+  std::clock_t const begin = std::clock();
+  work();
+  EXPECT_LT((std::clock() - begin) / CLOCKS_PER_SEC, kIsSanitized ? 60 : 8);
+}
+
+TEST(TReceivedNamespaceTest, ManyRootClassesAreReadSoon) {
+  TByteWriter writer;
+  writer.Number(0);
+  for (std::size_t n = 0; n < kMostClasses; ++n) WriteClass(writer, "X" + std::to_string(n), 0);
+  writer.Byte(0);
+  for (std::size_t n = 0; n < kMostClasses; ++n) WriteEndOfTree(writer);
+  ExpectSoon([&] { EXPECT_EQ(ClassesOf(*TReceivedNamespace::From(Head(kMostClasses) + writer.Bytes())).size(), kMostClasses); });
+}
+
+TEST(TReceivedNamespaceTest, TheInstancesOfManySubclassesAreReadSoon) {
+  TByteWriter writer;
+  writer.Number(0);
+  for (std::size_t n = 0; n < kMostClasses; ++n) WriteClass(writer, "X" + std::to_string(n), n == 0 ? 0 : 1);
+  writer.Byte(0);
+  for (std::size_t n = 0; n < kMostClasses; ++n) {
+    writer.Number(kLayout);
+    writer.Number(n);
+    writer.Byte(0);
+    writer.Number(0);  // properties
+    writer.Number(kInstance);
+    writer.Number(n);
+    writer.Raw(PathOfKeys({}));
+  }
+  WriteEndOfTree(writer);
+  ExpectSoon([&] {
+    auto const ns = TReceivedNamespace::From(Head(kMostClasses) + writer.Bytes());
+    TNamespaceView const view("X", ns);
+    for (std::size_t n = 1; n < kMostClasses; ++n) ASSERT_EQ(view.InstancesOf("X" + std::to_string(n)).size(), 1u);
+    EXPECT_EQ(view.InstancesOf("X0").size(), kMostClasses);
+    EXPECT_EQ(view.PathOf(*view.InstancesOf("X7").front()), "root/x:X7#1");
+  });
+}
+
+TEST(TReceivedNamespaceTest, ThePropertiesOfAWideInstanceAreReadSoon) {
+  std::vector<std::pair<std::string, TCIMValue>> properties;
+  TCIMValue const list(TCIMValue::TCIMType::kCIMTypeUint8, 0, std::vector<TCIMValue>(200, static_cast<unsigned char>(1)));
+  while (properties.size() < kMostElements) properties.emplace_back("P" + std::to_string(properties.size()), list);
+  ExpectSoon([&] {
+    auto const ns = TReceivedNamespace::From(OneInstance(properties, PathOfKeys({})));
+    auto const instance = TNamespaceView("X", ns).AllInstances().front();
+    for (auto const& [name, value] : properties) ASSERT_TRUE(instance->GetProperty(name, kNone));
+    EXPECT_FALSE(instance->GetProperty("P", kNone));
+    EXPECT_EQ(instance->GetProperty("p9999", kNone)->GetValue(kNone), list);
+  });
+}
+
+TEST(TReceivedNamespaceTest, ReferencesToAClassOutsideWithManyKeysAreReadSoon) {
+  TByteWriter writer;
+  writer.Number(0);
+  WriteClass(writer, "X_Item", 0);
+  writer.Byte(0);
+  writer.Number(kLayout);
+  writer.Number(0);
+  writer.Byte(0);
+  writer.Number(2000);
+  for (int n = 0; n < 2000; ++n) writer.Text("P" + std::to_string(n)), writer.Number(0);
+  writer.Number(kInstance);
+  writer.Number(0);
+  for (int n = 0; n < 2000; ++n) {
+    writer.Byte(TCIMValue::TCIMType::kCIMTypeReference);
+    writer.Byte(0);    // it has no namespace
+    writer.Number(1);  // its class is outside
+    writer.Text("Y_Item");
+    writer.Text("");
+    writer.Number(kMostKeys);
+    for (std::size_t key = 0; key < kMostKeys; ++key) {
+      writer.Text("K" + std::to_string(n) + "_" + std::to_string(key));
+      WriteValue(writer, true, {});
+    }
+  }
+  writer.Raw(PathOfKeys({}));
+  WriteEndOfTree(writer);
+  ExpectSoon([&] {
+    auto const ns = TReceivedNamespace::From(Head(1) + writer.Bytes());
+    int references = 0;
+    TNamespaceView("X", ns).AllInstances().front()->EnumerateProperties(
+        [&](boost::shared_ptr<ICIMProperty> property) {
+          references += property->GetValue(kNone).IsReference() ? 1 : 0;
+          return true;
+        },
+        kNone);
+    EXPECT_EQ(references, 2000);
+  });
 }
 
 }  // namespace

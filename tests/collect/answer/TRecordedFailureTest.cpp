@@ -29,6 +29,11 @@ TEST(TRecordedFailureTest, EveryKindIsThrownAgain) {
   EXPECT_EQ(FailureOf([] { ReadAgain([] { throw 5; }).Throw(); }), "it threw an object that is not a std::exception");
 }
 
+TEST(TRecordedFailureTest, ALongTextIsCut) {
+  auto const failure = ReadAgain([] { throw std::runtime_error(std::string(5000, 'x')); });
+  EXPECT_EQ(FailureOf([&] { failure.Throw(); }), std::string(1021, 'x') + "...");
+}
+
 TEST(TRecordedFailureTest, AStatusCodeWithoutATextBecomesFail) {
   EXPECT_STATUS(ReadAgain([] { throw TZEPException(static_cast<EZEPStatusCode>(-7)); }).Throw(), kZEPStatusFail);
   TByteReader reader(std::string_view("\0\x7f\0", 3));

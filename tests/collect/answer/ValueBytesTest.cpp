@@ -17,6 +17,8 @@
 namespace NQRVZEP20 {
 namespace {
 
+std::uint64_t gValues = 0;  // that were checked
+
 using TType = TCIMValue::TCIMType;
 
 template <class TReal, class TBits>
@@ -106,7 +108,7 @@ TEST_F(ValueBytesTest, EveryValueIsReadAgainToTheLastBit) {
   for (TCIMValue const& value : Values()) {
     std::string const bytes = BytesOfValue(value);
     TByteReader checked(bytes), reader(bytes);
-    TValueChecker(0).CheckValue(checked);
+    TValueChecker(0, gValues).CheckValue(checked);
     EXPECT_EQ(checked.Left(), 0u);
     EXPECT_EQ(DumpOf(ReadValue(reader, *fNamespace)), DumpOf(value));
     EXPECT_EQ(reader.Left(), 0u);
@@ -118,7 +120,7 @@ TEST_F(ValueBytesTest, AValueThatIsCutOffIsRefused) {
     std::string const bytes = BytesOfValue(value);
     for (std::size_t size = 0; size < bytes.size() && size < 100; ++size) {
       TByteReader reader(std::string_view(bytes).substr(0, size));
-      EXPECT_THROW(TValueChecker(0).CheckValue(reader), TBadAnswer) << DumpOf(value) << " at " << size;
+      EXPECT_THROW(TValueChecker(0, gValues).CheckValue(reader), TBadAnswer) << DumpOf(value) << " at " << size;
     }
   }
 }
@@ -126,7 +128,7 @@ TEST_F(ValueBytesTest, AValueThatIsCutOffIsRefused) {
 std::string WhyRefused(std::string const& bytes) {
   TByteReader reader(bytes);
   try {
-    TValueChecker(1).CheckValue(reader);
+    TValueChecker(1, gValues).CheckValue(reader);
   } catch (TBadAnswer const& refusal) {
     return refusal.what();
   }
