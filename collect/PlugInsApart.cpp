@@ -2,6 +2,7 @@
 #include "collect/PlugInsApart.h"
 
 #include "TRootObject.h"
+#include "collect/process/Children.h"
 #include "collect/process/LogLines.h"
 #include "collect/process/TPlugInProcess.h"
 
@@ -19,6 +20,7 @@ namespace {
 
 using TClock = TPlugInProcess::TClock;
 constexpr std::chrono::milliseconds kShowEvery(100);
+constexpr std::chrono::milliseconds kLongestWait(200);  // so that a stop of this process is noticed soon
 
 // The processes of all plug-ins, in the order of the plug-ins.
 class TPool {
@@ -35,6 +37,7 @@ public:
     for (StartMore(); !fRunning.empty(); StartMore()) {
       Wait();
       Follow();
+      ShowProgress();
     }
     if (fOptions.fShowProgress) fOptions.fShowProgress({});
     for (std::string const& log : fLogs) LogAgain(log);
@@ -63,7 +66,7 @@ private:
     }
   }
 
-  void Wait() const {
+  void Wait() {
     std::vector<pollfd> polled;
     TClock::time_point next = TClock::time_point::max();
     for (TRunning const& running : fRunning) {
@@ -71,20 +74,47 @@ private:
       next = std::min(next, running.fProcess->NextDeadline());
     }
     auto wait = std::chrono::ceil<std::chrono::milliseconds>(next - TClock::now());
-    if (fOptions.fShowProgress) wait = std::min(wait, kShowEvery);
-    ::poll(polled.data(), polled.size(), static_cast<int>(std::clamp<long>(wait.count(), 0, 3600000)));
+    wait = std::clamp(wait, std::chrono::milliseconds(0), fOptions.fShowProgress ? kShowEvery : kLongestWait);
+    TClock::time_point const begin = TClock::now();
+    ::poll(polled.data(), polled.size(), static_cast<int>(wait.count()));
+    TClock::duration const longer = TClock::now() - begin - wait;
+    if (longer.count() > 0) Grant(longer);  // this process was stopped
+  }
+
+  // A plug-in is not to blame for the time in which this process did not read from it.
+  void Grant(TClock::duration time, TPlugInProcess const* except = nullptr) const {
+    for (TRunning const& running : fRunning)
+      if (running.fProcess.get() != except) running.fProcess->Grant(time);
   }
 
   void Follow() {
-    for (TRunning const& running : fRunning) running.fProcess->Follow();
+    for (TRunning const& running : fRunning) {
+      TClock::time_point const begin = TClock::now();
+      running.fProcess->Follow();
+      Grant(TClock::now() - begin, running.fProcess.get());
+    }
+    TakeEnded();
+  }
+
+  void TakeEnded() {
     auto const ended = std::stable_partition(fRunning.begin(), fRunning.end(),
                                              [](TRunning const& running) { return !running.fProcess->HasEnded(); });
+    bool hasOrphans = false;
     for (auto at = ended; at != fRunning.end(); ++at) {
+      hasOrphans = hasOrphans || at->fProcess->HasLostSupervisor();
       fResults[at->fNumber] = at->fProcess->Result();
       fLogs[at->fNumber] = at->fProcess->Log();
     }
     fRunning.erase(ended, fRunning.end());
-    ShowProgress();
+    if (hasOrphans) EndOrphans();
+  }
+
+  void EndOrphans() const {
+    std::vector<pid_t> supervisors;
+    for (TRunning const& running : fRunning) supervisors.push_back(running.fProcess->Supervisor());
+    TClock::time_point const begin = TClock::now();
+    fOrphans.End(supervisors);
+    Grant(TClock::now() - begin);
   }
 
   void ShowProgress() {
@@ -94,6 +124,7 @@ private:
     for (TRunning const& running : fRunning)
       atWork.push_back({running.fProcess->Name(), running.fProcess->Stage(), running.fProcess->SecondsInStage()});
     fOptions.fShowProgress(atWork);
+    Grant(TClock::now() - fLastShown);
   }
 
   static void LogAgain(std::string const& log) {
@@ -105,6 +136,7 @@ private:
   TApartOptions const& fOptions;
   std::size_t const fParallel;
   std::size_t fNext = 0;
+  TOrphans const fOrphans;  // outlives the processes
   std::vector<TRunning> fRunning;
   std::vector<TPlugIn> fResults;
   std::vector<std::string> fLogs;
@@ -113,17 +145,44 @@ private:
 
 std::string FileNameOf(TPlugIn const& plugIn) { return plugIn.fFile.substr(plugIn.fFile.rfind('/') + 1); }
 
-// If two plug-ins register the same name, the first one keeps it and the other one fails.
-void RefuseTakenNames(std::vector<TPlugIn>& plugIns) {
-  std::map<std::string, std::string> owners;  // the files of the plug-ins, by the names of providers
-  for (TPlugIn& plugIn : plugIns)
-    for (TProviderRun& run : plugIn.fProviders) {
-      auto const [owner, isNew] = owners.emplace(run.fName, FileNameOf(plugIn));
-      if (isNew || owner->second == FileNameOf(plugIn)) continue;
+// ---- Names that more than one plug-in registers ----
+
+struct TClaim {
+  std::string fFile;
+  TProviderRun* fRun;
+};
+
+// The claims of other files than the first are refused, or noted where they failed anyway. The name belongs to the first one that
+// has not failed.
+void Settle(std::vector<TClaim> const& claims) {
+  TClaim const& first = claims.front();
+  auto const hasView = [](TClaim const& claim) { return claim.fRun->fView != nullptr; };
+  auto const owner = std::find_if(claims.begin(), claims.end(), hasView);
+  for (TClaim const& claim : claims) {
+    TProviderRun& run = *claim.fRun;
+    if (claim.fFile == first.fFile) continue;
+    std::string const why = "the name " + run.fName + " is registered by " + first.fFile + ", which comes first";
+    if (!hasView(claim)) {
+      run.fError += "; " + why;
+    } else if (claim.fFile != owner->fFile) {
       run.fView.reset();
-      run.fError = "the name " + run.fName + " is already registered by " + owner->second;
+      run.fError = "the name " + run.fName + " is registered by " + owner->fFile + ", which comes first";
       run.fStage = NameOf(EStage::kRegistration);
     }
+  }
+  auto const second = std::find_if(claims.begin(), claims.end(), [&](TClaim const& claim) { return claim.fFile != first.fFile; });
+  if (second == claims.end() || hasView(first)) return;
+  bool const isOwner = owner != claims.end() && owner->fFile != first.fFile;
+  TClaim const& other = isOwner ? *owner : *second;
+  first.fRun->fError += "; the name " + first.fRun->fName + " is also registered by " + other.fFile + ", which comes after it" +
+                        (isOwner ? " and counts instead" : "");
+}
+
+void SettleNames(std::vector<TPlugIn>& plugIns) {
+  std::map<std::string, std::vector<TClaim>> claims;  // in the order of the plug-ins, by the names of providers
+  for (TPlugIn& plugIn : plugIns)
+    for (TProviderRun& run : plugIn.fProviders) claims[run.fName].push_back({FileNameOf(plugIn), &run});
+  for (auto const& [name, ofName] : claims) Settle(ofName);
 }
 
 }  // namespace
@@ -134,7 +193,7 @@ std::vector<TPlugIn> LoadPlugInsApart(std::vector<TPlugInFile> files, std::optio
   auto const isOfNoInterest = [](TPlugInFile const& file) { return !file.IsLoaded() && !file.fIsMeant; };
   files.erase(std::remove_if(files.begin(), files.end(), isOfNoInterest), files.end());
   std::vector<TPlugIn> plugIns = TPool(std::move(files), sample ? sample->fLabel : "", options).Run();
-  RefuseTakenNames(plugIns);
+  SettleNames(plugIns);
   return plugIns;
 }
 

@@ -29,13 +29,17 @@ struct TApartOptions {
 
 // Like LoadPlugIns, but runs each plug-in in a process of its own, several in parallel, so that a faulty plug-in affects only
 // its own result. The namespaces are immutable copies, which the processes send in serialised form. The results are in the
-// order of the files; if two providers have the same name, the first one is used and the other one fails.
+// order of the files. If two plug-ins register providers with the same name, the first one that fills its namespace is used; the
+// row of the other one names both, and which comes first.
 //
 // The printed output of a plug-in is in its result; its log entries are written to this process's log after it has ended. No
-// process that a plug-in started outlives this call or this process.
+// process that a plug-in started outlives this call or this process, with these exceptions: it forks faster than it is killed,
+// it waits for a device, or the plug-in has killed both its supervisor and this process.
 //
-// Forks this process: call it before other threads are started. A plug-in can read the memory that this process had at that
-// time, so read passwords afterwards. Blocks until all plug-ins have ended or exceeded a limit.
+// Forks this process: call it before other threads are started, and start no process meanwhile: for that time this process is
+// the parent of orphans, and kills those of a plug-in (process/Children.h). A time limit does not run while this process is
+// stopped or busy, as with a slow terminal. A plug-in can read the memory that this process had at that time, so read passwords
+// afterwards. Blocks until all plug-ins have ended or exceeded a limit.
 std::vector<TPlugIn> LoadPlugInsApart(std::vector<TPlugInFile> files, std::optional<TSample> const& sample = std::nullopt,
                                       TApartOptions const& options = {});
 

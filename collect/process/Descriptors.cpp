@@ -20,13 +20,25 @@ void CloseRange(unsigned int first, unsigned int last) {
   for (unsigned int fd = first; fd <= last && fd < end; ++fd) ::close(static_cast<int>(fd));
 }
 
+[[noreturn]] void ThrowNoPipe() { throw std::system_error(errno, std::generic_category(), "no pipe"); }
+
+TUniqueFd AboveStandard(TUniqueFd fd) {
+  if (fd.get() >= static_cast<int>(kFirst)) return fd;
+  TUniqueFd moved(::fcntl(fd.get(), F_DUPFD_CLOEXEC, static_cast<int>(kFirst)));
+  if (!moved) ThrowNoPipe();
+  return moved;
+}
+
 }  // namespace
 
 TPipe OpenPipe() {
   int ends[2];
-  if (::pipe2(ends, O_CLOEXEC) != 0) throw std::system_error(errno, std::generic_category(), "no pipe");
-  ::fcntl(ends[0], F_SETFL, O_NONBLOCK);
-  return {TUniqueFd(ends[0]), TUniqueFd(ends[1])};
+  if (::pipe2(ends, O_CLOEXEC) != 0) ThrowNoPipe();
+  TPipe pipe{TUniqueFd(ends[0]), TUniqueFd(ends[1])};
+  pipe.fReadEnd = AboveStandard(std::move(pipe.fReadEnd));
+  pipe.fWriteEnd = AboveStandard(std::move(pipe.fWriteEnd));
+  ::fcntl(pipe.fReadEnd.get(), F_SETFL, O_NONBLOCK);
+  return pipe;
 }
 
 void CloseAllBut(std::vector<int> kept) {
@@ -42,7 +54,7 @@ void CloseAllBut(std::vector<int> kept) {
 
 void MakeNull(int fd) {
   TUniqueFd null(::open("/dev/null", O_RDWR));
-  ::dup2(null.get(), fd);
+  if (!null || ::dup2(null.get(), fd) < 0) ::close(fd);
   if (null.get() == fd) null.release();
 }
 

@@ -1,6 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/process/LogLines.h"
 
+#include "collect/SafeText.h"
+#include "collect/answer/AnswerLimits.h"
+
+#include <algorithm>
 #include <regex>
 #include <sstream>
 
@@ -9,6 +13,8 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr char const* kLabels[] = {"Error", "Warning", "Status", "Debug", "Verbose"};  // by severity
+
+constexpr std::size_t kEnd = 64 * 1024;  // searched for the last entry
 
 }  // namespace
 
@@ -32,10 +38,11 @@ std::vector<TLogLine> LogLinesOf(std::string const& text) {
 }
 
 std::string LastLogLineOf(std::string const& text) {
-  std::vector<TLogLine> const lines = LogLinesOf(text);
+  std::vector<TLogLine> const lines = LogLinesOf(text.substr(text.size() - std::min(text.size(), kEnd)));
   if (lines.empty()) return "";
   std::string const& message = lines.back().fMessage;
-  return "[" + std::string(kLabels[lines.back().fSeverity]) + "] " + message.substr(0, message.find('\n'));
+  std::string const line = "[" + std::string(kLabels[lines.back().fSeverity]) + "] " + message.substr(0, message.find('\n'));
+  return Shortened(line, kLongestFailure);
 }
 
 }  // namespace NQRVZEP20

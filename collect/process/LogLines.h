@@ -18,7 +18,8 @@ struct TLogLine {
 // is a continuation of the previous message.
 std::vector<TLogLine> LogLinesOf(std::string const& text);
 
-// The last entry, with only the first line of its message: "[Error] no disk". Empty if there is no entry.
+// The last entry, with only the first line of its message: "[Error] no disk". A long line is cut (AnswerLimits.h). Empty if there
+// is no entry in the last 64 KiB.
 std::string LastLogLineOf(std::string const& text);
 
 }  // namespace NQRVZEP20

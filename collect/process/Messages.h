@@ -13,10 +13,10 @@ enum class EMessage : unsigned char {
   kStage,       // a stage of loading begins: one byte, an EStage
   kRegistered,  // a provider has been registered: its name
   kTaken,       // a provider has not been registered, because its name is taken: the name
-  kLoaded,      // loading has ended: the time in milliseconds, as text
+  kLoaded,      // loading has ended: the time in microseconds, as text
   kFilling,     // a provider begins to fill its namespace: its name
   kBytes,       // a chunk of the serialised namespace (NamespaceBytes.h)
-  kFilled,      // the namespace is complete: the time to fill it in milliseconds, as text
+  kFilled,      // the namespace is complete: the time to fill it in microseconds, as text
   kFailed,      // loading, or the provider, has failed: why. Later messages are about the next provider
   kFatal,       // the same, but the process ends
   kExits,       // the plug-in has called exit: the status, as text

@@ -21,6 +21,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <cmath>
 #include <cstdio>
 #include <exception>
 #include <fstream>
@@ -62,6 +63,8 @@ void Send(EMessage kind, std::string_view text) {
   WriteWhole(HeadOf(kind, sent.size()));
   WriteWhole(sent);
 }
+
+void SendTime(EMessage kind, double milliseconds) { Send(kind, std::to_string(std::llround(milliseconds * 1000))); }
 
 void SendStage(EStage stage) { Send(EMessage::kStage, std::string(1, static_cast<char>(stage))); }
 
@@ -108,11 +111,15 @@ void RedirectLog(int fd) {
   ::close(fd);
 }
 
+// With a limit of one byte, the kernel neither writes a file nor passes a dump to a program, which it does with a limit of zero
+// (core(5)). The process remains one that a debugger can attach to, unless that limit cannot be had.
 void WriteNoCoreDump() {
-  rlimit const none{0, 0};
-  ::setrlimit(RLIMIT_CORE, &none);
-  ::prctl(PR_SET_DUMPABLE, 0);  // the system may pass a dump to a program, whatever the limit is
+  rlimit const one{1, 1};
+  if (::setrlimit(RLIMIT_CORE, &one) != 0) ::prctl(PR_SET_DUMPABLE, 0);
 }
+
+// When memory is short, the system ends this process rather than the owner.
+void BeTheFirstWithoutMemory() { std::ofstream("/proc/self/oom_score_adj") << 500; }
 
 void LimitMemory(std::uint64_t bytes) {
   if (bytes == 0) return;
@@ -125,6 +132,7 @@ void LimitMemory(std::uint64_t bytes) {
 
 void SetUp(TChildSetup const& setup) {
   gProcess = ::getpid();
+  CloseAllBut({setup.fAnswer, setup.fWords, setup.fLog});
   MakeNull(STDIN_FILENO);
   ::dup2(setup.fWords, STDOUT_FILENO);
   ::dup2(setup.fWords, STDERR_FILENO);
@@ -133,6 +141,7 @@ void SetUp(TChildSetup const& setup) {
   RedirectLog(setup.fLog);
   std::setvbuf(stdout, nullptr, _IOLBF, 0);  // words that a plug-in prints before it crashes are not lost
   WriteNoCoreDump();
+  BeTheFirstWithoutMemory();
   LimitMemory(setup.fMemoryBytes);
   std::set_terminate(OnTerminate);
   ::on_exit(OnExit, nullptr);
@@ -168,7 +177,7 @@ void Load(TChildSetup const& setup) {
   TTimedFailure const failure = TimedFailureOf([&] { LoadLibraryOf({setup.fName, setup.fFile}); });
   if (IsOfLinker(failure)) SendStage(EStage::kOpen);
   if (!failure.fMessage.empty()) Send(EMessage::kFailed, failure.ReasonOrMessage());
-  Send(EMessage::kLoaded, std::to_string(failure.fMilliseconds));
+  SendTime(EMessage::kLoaded, failure.fMilliseconds);
 }
 
 void Fill(INamespaceProvider& provider) {
@@ -182,7 +191,7 @@ void Fill(INamespaceProvider& provider) {
   if (failure.fMessage.empty())
     failure = TimedFailureOf([&] { WriteNamespace(*ns, [](std::string_view bytes) { Send(EMessage::kBytes, bytes); }); });
   if (failure.fMessage.empty())
-    Send(EMessage::kFilled, std::to_string(milliseconds));
+    SendTime(EMessage::kFilled, milliseconds);
   else
     Send(EMessage::kFailed, failure.MessageAndReason());
 }

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/process/Supervisor.h"
 
+#include "collect/process/Children.h"
 #include "collect/process/Descriptors.h"
 
 #include <poll.h>
@@ -12,8 +13,6 @@
 
 #include <cerrno>
 #include <cstdlib>
-#include <fstream>
-#include <string>
 
 namespace NQRVZEP20 {
 
@@ -46,7 +45,7 @@ TUniqueFd BlockAndWatchChildren() {
 
 class TSupervised {
 public:
-  explicit TSupervised(pid_t child) : fChild(child), fVerdict{0, false} {}
+  explicit TSupervised(pid_t child) : fChild(child), fVerdict{0, false, 0} {}
 
   // Reaps the child, and orphans that became children. True when the child has ended.
   bool HasEnded() {
@@ -81,10 +80,8 @@ private:
 
   // A child may be stopped. The list is missing on a kernel that was built without it; then only the plug-in itself is ended.
   void KillChildren() const {
-    std::string const self = std::to_string(::getpid());
-    std::ifstream children("/proc/self/task/" + self + "/children");
     if (!fHasEnded) ::kill(fChild, SIGKILL);
-    for (pid_t child; children >> child;) ::kill(child, SIGKILL);
+    for (pid_t const child : Children()) ::kill(child, SIGKILL);
   }
 
   pid_t const fChild;
@@ -92,17 +89,28 @@ private:
   TVerdict fVerdict;
 };
 
+void Send(int fd, TVerdict const& verdict) { [[maybe_unused]] ssize_t const sent = ::write(fd, &verdict, sizeof verdict); }
+
+[[noreturn]] void GiveUp(int fd) {
+  Send(fd, {0, true, errno});
+  ::_exit(1);
+}
+
 }  // namespace
 
 void Supervise(TSupervisorEnds const& ends, std::function<void()> const& work) {
   ::setsid();
   ResetSignals();
   ::prctl(PR_SET_CHILD_SUBREAPER, 1);
+  std::vector<int> kept = ends.fOfWork;
+  kept.insert(kept.end(), {ends.fControl, ends.fVerdict});
+  CloseAllBut(kept);
   TUniqueFd const ended = BlockAndWatchChildren();
+  if (!ended) GiveUp(ends.fVerdict);
   pid_t const supervisor = ::getpid();
   pid_t const child = ::fork();
   if (child == 0) BeChild(supervisor, work);
-  if (child < 0) ::_exit(1);  // the owner gets no verdict
+  if (child < 0) GiveUp(ends.fVerdict);
 
   for (int const fd : {0, 1, 2}) MakeNull(fd);
   CloseAllBut({ends.fControl, ends.fVerdict, ended.get()});
@@ -114,7 +122,7 @@ void Supervise(TSupervisorEnds const& ends, std::function<void()> const& work) {
     while (::read(ended.get(), &ignored, sizeof ignored) > 0) continue;
   }
   supervised.EndAll();
-  [[maybe_unused]] ssize_t const sent = ::write(ends.fVerdict, &supervised.Verdict(), sizeof(TVerdict));
+  Send(ends.fVerdict, supervised.Verdict());
   ::_exit(0);
 }
 

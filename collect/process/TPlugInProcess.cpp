@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/process/TPlugInProcess.h"
 
-#include "collect/FailureOf.h"
-#include "collect/answer/TReceivedNamespace.h"
 #include "collect/process/LogLines.h"
 #include "collect/process/PlugInChild.h"
 #include "collect/process/SignalText.h"
@@ -13,8 +11,10 @@
 
 #include <algorithm>
 #include <array>
-#include <cstdlib>
+#include <cerrno>
+#include <cstdio>
 #include <cstring>
+#include <iostream>
 #include <system_error>
 
 namespace NQRVZEP20 {
@@ -23,9 +23,9 @@ namespace {
 
 constexpr std::size_t kMostWords = 4096;             // kept of either end
 constexpr std::size_t kMostLog = 16u * 1024 * 1024;  // the last line is kept of a longer log, too
-constexpr std::size_t kMostProviders = 10'000;
-constexpr std::chrono::seconds kGrace(5);       // for a process whose pipe is closed to end by itself
-constexpr std::chrono::seconds kTimeToEnd(10);  // for a supervisor to end everything
+constexpr std::chrono::seconds kGrace(5);            // for a process whose pipe is closed to end by itself
+constexpr std::chrono::seconds kTimeToEnd(10);       // for a supervisor to end everything
+constexpr int kMostDrains = 64;                      // mebibytes that a pipe may still hold at the end
 
 // Reads what has arrived, up to a mebibyte, and passes it on. Closes the descriptor at the end of the pipe.
 template <class TTake>
@@ -41,25 +41,38 @@ void ReadFrom(TUniqueFd& fd, TTake take) {
 }
 
 pid_t ForkOrThrow() {
-  std::fflush(nullptr);  // a child must not write what is still in the buffers
+  std::cout.flush();  // a child must not write what is still in the buffers
+  std::fflush(nullptr);
   pid_t const child = ::fork();
   if (child < 0) throw std::system_error(errno, std::generic_category(), "no process");
   return child;
+}
+
+bool HasInput(int fd, std::chrono::milliseconds wait) {
+  pollfd waiting{fd, POLLIN, 0};
+  return ::poll(&waiting, 1, static_cast<int>(wait.count())) > 0;
 }
 
 }  // namespace
 
 TPlugInProcess::TPlugInProcess(std::string const& name, std::string const& file, TApartLimits const& limits,
                                std::string sampleLabel)
-    : fLimits(limits), fSampleLabel(std::move(sampleLabel)), fResult{name, file, 0, "", {}}, fWords(kMostWords) {
+    : fLimits(limits),
+      fResult{name, file, 0, "", {}},
+      fAnswer(name, file, limits, std::move(sampleLabel),
+              [this] {
+                ReadLog();  // the lines that were logged before the failure have arrived
+                return LastLogLineOf(fLog);
+              }),
+      fWords(kMostWords) {
   Start(limits);
   fDeadline = TClock::now() + std::chrono::seconds(limits.fTimeoutSeconds);
 }
 
 TPlugInProcess::~TPlugInProcess() {
   fControl.reset();
-  if (fSupervisor > 0)
-    while (::waitpid(fSupervisor, nullptr, 0) < 0 && errno == EINTR) continue;
+  if (fVerdictEnd) HasInput(fVerdictEnd.get(), kTimeToEnd);
+  EndSupervisor();
 }
 
 void TPlugInProcess::Start(TApartLimits const& limits) {
@@ -68,18 +81,19 @@ void TPlugInProcess::Start(TApartLimits const& limits) {
                           words.fWriteEnd.get(), log.fWriteEnd.get(), limits.fMemoryMebibytes * 1024 * 1024};
   fSupervisor = ForkOrThrow();
   if (fSupervisor == 0) {
-    control.fWriteEnd.reset();  // so that the end of the owner is seen
-    Supervise({control.fReadEnd.get(), verdict.fWriteEnd.get()}, [&] { RunPlugIn(setup); });
+    control.fWriteEnd.release();  // closed with all others, so that the end of the owner is seen
+    Supervise({control.fReadEnd.get(), verdict.fWriteEnd.get(), {setup.fAnswer, setup.fWords, setup.fLog}},
+              [&] { RunPlugIn(setup); });
   }
   fControl = std::move(control.fWriteEnd);
-  fAnswer = std::move(answer.fReadEnd);
+  fAnswerEnd = std::move(answer.fReadEnd);
   fWordsEnd = std::move(words.fReadEnd);
   fLogEnd = std::move(log.fReadEnd);
   fVerdictEnd = std::move(verdict.fReadEnd);
 }
 
 void TPlugInProcess::AddTo(std::vector<pollfd>& polled) const {
-  for (TUniqueFd const* const fd : {&fAnswer, &fWordsEnd, &fLogEnd, &fVerdictEnd})
+  for (TUniqueFd const* const fd : {&fAnswerEnd, &fWordsEnd, &fLogEnd, &fVerdictEnd})
     if (*fd) polled.push_back({fd->get(), POLLIN, 0});
 }
 
@@ -88,51 +102,68 @@ TPlugInProcess::TClock::time_point TPlugInProcess::NextDeadline() const {
   return fDeadline.value_or(TClock::time_point::max());
 }
 
+void TPlugInProcess::Grant(TClock::duration time) {
+  if (fDeadline) *fDeadline += time;
+  if (fGiveUpAt) *fGiveUpAt += time;
+}
+
 // The verdict is sent when no process of the plug-in is left: what the pipes hold then is all that will come.
 void TPlugInProcess::Follow() {
-  bool const hasVerdict = [&] {
-    ReadVerdict();
-    return !fVerdictEnd;
-  }();
+  ReadVerdict();
+  bool const hasVerdict = !fVerdictEnd;
   ReadAnswer();
   ReadWords();
   ReadLog();
   if (!hasVerdict) return CheckDeadlines();
-  while (fAnswer && fEnding == EEnding::kNone) {
-    TUniqueFd const& answer = fAnswer;
-    pollfd waiting{answer.get(), POLLIN, 0};
-    if (::poll(&waiting, 1, 0) <= 0) break;
+  DrainAnswer();
+  Complete();
+}
+
+// A process that has escaped may write for ever.
+void TPlugInProcess::DrainAnswer() {
+  for (int n = 0; n < kMostDrains && fAnswerEnd && fEnding == EEnding::kNone; ++n) {
+    if (!HasInput(fAnswerEnd.get(), std::chrono::milliseconds(0))) return;
     ReadAnswer();
   }
-  Complete();
 }
 
 // ---- Reading ----
 
 void TPlugInProcess::ReadAnswer() {
-  ReadFrom(fAnswer, [&](std::string_view bytes) {
+  ReadFrom(fAnswerEnd, [&](std::string_view bytes) {
     if (fEnding != EEnding::kNone) return;  // dropped
-    fMessages.Add(bytes);
-    while (fEnding == EEnding::kNone) {
-      auto const message = fMessages.Next();
-      if (!message) break;
-      Take(*message);
+    fAnswer.Add(bytes);
+    if (fAnswer.HasLoaded()) StartFillTime();
+    switch (fAnswer.State()) {
+      case TPlugInAnswer::EState::kOpen:
+        return;
+      case TPlugInAnswer::EState::kDone:
+        return End(EEnding::kDone);
+      case TPlugInAnswer::EState::kTooLong:
+        return End(EEnding::kTooLong);
+      case TPlugInAnswer::EState::kBad:
+        return End(EEnding::kBadAnswer);
     }
-    if (!fMessages.IsBad()) return;
-    fWhyBad = "malformed message";
-    End(EEnding::kBadAnswer);
   });
-  if (!fAnswer && !fGiveUpAt) fGiveUpAt = TClock::now() + kGrace;
+  if (!fAnswerEnd && !fGiveUpAt) fGiveUpAt = TClock::now() + kGrace;
+}
+
+// Once.
+void TPlugInProcess::StartFillTime() {
+  if (fIsInFillTime) return;
+  fIsInFillTime = true;
+  fDeadline = TClock::now() + std::chrono::seconds(fLimits.fTimeoutSeconds);
 }
 
 void TPlugInProcess::ReadWords() {
   ReadFrom(fWordsEnd, [&](std::string_view text) { fWords.Add(text); });
 }
 
+// The middle is removed rarely, because that moves the end.
 void TPlugInProcess::ReadLog() {
   ReadFrom(fLogEnd, [&](std::string_view text) {
     fLog.append(text);
-    if (fLog.size() > kMostLog) fLog.erase(kMostLog / 2, fLog.size() - kMostLog);
+    if (fLog.size() > kMostLog + kMostLog / 2) fLog.erase(kMostLog / 2, fLog.size() - kMostLog);
   });
 }
 
@@ -143,98 +174,6 @@ void TPlugInProcess::ReadVerdict() {
     std::memcpy(&verdict, bytes.data(), sizeof verdict);
     fVerdict = verdict;
   });
-}
-
-void TPlugInProcess::Take(TMessage const& message) {
-  switch (message.fKind) {
-    case EMessage::kStage:
-      return Begin(static_cast<EStage>(message.fText.empty() ? '\0' : message.fText[0]));
-    case EMessage::kRegistered:
-      RunOf(message.fText);
-      return;
-    case EMessage::kTaken:
-      fResult.fProviders.push_back({message.fText, nullptr, 0,
-                                    "the plug-in registers this name twice; the second registration is ignored",
-                                    NameOf(EStage::kRegistration), ""});
-      return;
-    case EMessage::kLoaded:
-      if (fHasLoaded) return;
-      fResult.fMilliseconds = std::strtod(message.fText.c_str(), nullptr);
-      fHasLoaded = true;
-      fDeadline = TClock::now() + std::chrono::seconds(fLimits.fTimeoutSeconds);  // of the fill
-      return;
-    case EMessage::kFilling:
-      fProvider = message.fText;
-      fBytes.clear();
-      return Begin(EStage::kFill);
-    case EMessage::kBytes:
-      if (fBytes.size() + message.fText.size() > fLimits.fAnswerBytes) return End(EEnding::kTooLong);
-      fBytes += message.fText;
-      return;
-    case EMessage::kFilled:
-      return TakeNamespace(message.fText);
-    case EMessage::kFailed:
-      return TakeFailure(message.fText);
-    case EMessage::kFatal:
-      fFatal = message.fText;
-      return;
-    case EMessage::kExits:
-      fExitStatus = message.fText;
-      return;
-    case EMessage::kDone:
-      return End(EEnding::kDone);
-  }
-}
-
-void TPlugInProcess::TakeNamespace(std::string const& milliseconds) {
-  TProviderRun* const run = CurrentRun();
-  if (run == nullptr) return;
-  run->fMilliseconds = std::strtod(milliseconds.c_str(), nullptr);
-  std::string const failure = FailureOf([&] {
-    auto const ns = TReceivedNamespace::From(std::move(fBytes));
-    run->fView = std::make_shared<TNamespaceView>(run->fName, ns, fSampleLabel);
-  });
-  if (!failure.empty()) TakeFailure(failure);
-  fBytes = std::string();
-  fProvider.reset();
-}
-
-// The failure of the provider that is filling its namespace, or else of the plug-in, of which the first one counts. The lines
-// that were logged before the failure have arrived.
-void TPlugInProcess::TakeFailure(std::string why) {
-  if (!fProvider && !fResult.fError.empty()) return;
-  bool const isOutOfMemory = fLimits.fMemoryMebibytes != 0 && why.find("std::bad_alloc") != why.npos;
-  if (isOutOfMemory) why += " (the memory limit is " + std::to_string(fLimits.fMemoryMebibytes) + " MiB)";
-  ReadLog();
-  if (TProviderRun* const run = CurrentRun()) {
-    run->fError = why;
-    run->fStage = NameOf(EStage::kFill);
-    run->fLastLogLine = LastLogLineOf(fLog);
-    fProvider.reset();
-  } else {
-    fResult.fError = why;
-    fResult.fStage = NameOf(fStage);
-    fResult.fLastLogLine = LastLogLineOf(fLog);
-  }
-}
-
-void TPlugInProcess::Begin(EStage stage) {
-  fStage = std::min(stage, EStage::kFill);
-  fStageBegan = TClock::now();
-}
-
-TProviderRun& TPlugInProcess::RunOf(std::string const& name) {
-  if (fResult.fProviders.size() > kMostProviders) return fResult.fProviders.back();
-  auto const place = std::find_if(fResult.fProviders.begin(), fResult.fProviders.end(),
-                                  [&](TProviderRun const& run) { return run.fName >= name && run.fError.empty(); });
-  return *fResult.fProviders.insert(place, {name, nullptr, 0, ""});
-}
-
-TProviderRun* TPlugInProcess::CurrentRun() {
-  if (!fProvider) return nullptr;
-  for (TProviderRun& run : fResult.fProviders)
-    if (run.fName == *fProvider && run.fError.empty() && !run.fView) return &run;
-  return &RunOf(*fProvider);
 }
 
 // ---- Ending ----
@@ -251,40 +190,37 @@ void TPlugInProcess::CheckDeadlines() {
   if (fEnding == EEnding::kNone) {
     if (fDeadline && now >= *fDeadline) return End(EEnding::kTimeUp);
     if (fGiveUpAt && now >= *fGiveUpAt) End(EEnding::kClosed);
-  } else if (now >= *fGiveUpAt) {  // a process that waits for a device cannot be ended
-    ::kill(fSupervisor, SIGKILL);
+  } else if (now >= *fGiveUpAt) {  // the supervisor is stopped, or a process waits for a device and cannot be ended
     Complete();
   }
 }
 
 void TPlugInProcess::Complete() {
-  fAnswer.reset();
+  EndSupervisor();
+  fAnswerEnd.reset();
   ReadWords();
   ReadLog();
-  if (fEnding != EEnding::kDone) TakeFailure(WhyDead());
-  RecordUnfilled();
-  fResult.fWords = fWords.Get();
+  if (fEnding != EEnding::kDone) fAnswer.Fail(WhyDead());
+  fResult = fAnswer.Finish(fWords.Get());
   fHasEnded = true;
 }
 
-// Of the providers that came after the one that ended the process, and of those that were registered after the load.
-void TPlugInProcess::RecordUnfilled() {
-  for (TProviderRun& run : fResult.fProviders)
-    if (!run.fView && run.fError.empty()) {
-      run.fError = fEnding == EEnding::kDone ? "not filled, because it was registered after the plug-in had been loaded"
-                                             : "not filled, because the plug-in process had ended";
-      run.fStage = NameOf(EStage::kFill);
-    }
+// It has given its word, or never will.
+void TPlugInProcess::EndSupervisor() {
+  if (fSupervisor <= 0) return;
+  ::kill(fSupervisor, SIGKILL);
+  while (::waitpid(fSupervisor, nullptr, 0) < 0 && errno == EINTR) continue;
+  fSupervisor = -1;
 }
 
 std::string TPlugInProcess::WhyDead() const {
-  std::string const limit = std::to_string(fLimits.fTimeoutSeconds) + " s";
-  if (fEnding == EEnding::kTimeUp) return "it exceeded the time limit of " + limit;
+  if (fEnding == EEnding::kTimeUp) return "it exceeded the time limit of " + std::to_string(fLimits.fTimeoutSeconds) + " s";
   if (fEnding == EEnding::kTooLong) return "its result exceeds " + std::to_string(fLimits.fAnswerBytes) + " bytes";
-  if (fEnding == EEnding::kBadAnswer) return "its result is invalid: " + fWhyBad;
-  if (fFatal) return *fFatal;
-  if (fExitStatus) return "it exited with status " + *fExitStatus;
+  if (fEnding == EEnding::kBadAnswer) return "its result is invalid: " + fAnswer.WhyBad();
+  if (fAnswer.Ending()) return *fAnswer.Ending();
   if (!fVerdict) return "its supervisor process died";
+  if (fVerdict->fStartFailure != 0)
+    return "no process could be started for it: " + std::generic_category().message(fVerdict->fStartFailure);
   if (fEnding == EEnding::kClosed && !fVerdict->fHadEndedByItself) return "it closed the descriptor for its result";
   if (WIFEXITED(fVerdict->fStatus)) return "it exited with status " + std::to_string(WEXITSTATUS(fVerdict->fStatus));
   return "it was killed by " + SignalText(WTERMSIG(fVerdict->fStatus));

@@ -5,8 +5,8 @@
 #include "collect/PlugIns.h"
 #include "collect/process/Descriptors.h"
 #include "collect/process/EStage.h"
-#include "collect/process/Messages.h"
 #include "collect/process/Supervisor.h"
+#include "collect/process/TPlugInAnswer.h"
 #include "collect/process/TWords.h"
 
 #include <poll.h>
@@ -23,7 +23,7 @@ namespace NQRVZEP20 {
 // the process is still running when the handle is destroyed, it is killed. The calling process must be single-threaded.
 class TPlugInProcess {
 public:
-  using TClock = std::chrono::steady_clock;
+  using TClock = TPlugInAnswer::TClock;
 
   // Starts the process. If a pipe or process cannot be created, throws std::system_error and leaks nothing.
   TPlugInProcess(std::string const& name, std::string const& file, TApartLimits const& limits, std::string sampleLabel);
@@ -37,13 +37,20 @@ public:
   // Reads the available data, and kills the process if a time limit has expired. Does not block.
   void Follow();
 
+  // Shifts the time limits: the owner was stopped, or busy, and did not read.
+  void Grant(TClock::duration time);
+
   bool HasEnded() const { return fHasEnded; }  // if true, the result is complete
   TPlugIn const& Result() const { return fResult; }
-  std::string const& Log() const { return fLog; }  // in the format of a log file
+  std::string const& Log() const { return fLog; }   // in the format of a log file
+  pid_t Supervisor() const { return fSupervisor; }  // or -1
+
+  // Whether it has ended without the word of its supervisor: then there may be orphans (Children.h).
+  bool HasLostSupervisor() const { return fHasEnded && !fVerdict; }
 
   std::string const& Name() const { return fResult.fName; }
-  std::string Stage() const { return fProvider ? NameOf(EStage::kFill) : NameOf(fStage); }
-  double SecondsInStage() const { return std::chrono::duration<double>(TClock::now() - fStageBegan).count(); }
+  std::string Stage() const { return NameOf(fAnswer.Stage()); }
+  double SecondsInStage() const { return std::chrono::duration<double>(TClock::now() - fAnswer.StageBegan()).count(); }
 
 private:
   enum class EEnding { kNone, kDone, kTimeUp, kTooLong, kBadAnswer, kClosed };
@@ -53,39 +60,27 @@ private:
   void ReadWords();
   void ReadLog();
   void ReadVerdict();
-  void Take(TMessage const& message);
-  void TakeNamespace(std::string const& milliseconds);
-  void TakeFailure(std::string why);
-  void Begin(EStage stage);
+  void DrainAnswer();
+  void StartFillTime();
   void End(EEnding ending);  // only the first call sets the reason
   void CheckDeadlines();
   void Complete();
-  void RecordUnfilled();
+  void EndSupervisor();
   std::string WhyDead() const;
-  TProviderRun& RunOf(std::string const& name);
-  TProviderRun* CurrentRun();
 
   TApartLimits const fLimits;
-  std::string const fSampleLabel;
-  TPlugIn fResult;
+  TPlugIn fResult;  // only names until the end
   pid_t fSupervisor = -1;
-  TUniqueFd fControl, fAnswer, fWordsEnd, fLogEnd, fVerdictEnd;  // empty when closed
+  TUniqueFd fControl, fAnswerEnd, fWordsEnd, fLogEnd, fVerdictEnd;  // below 0 when closed
 
-  TMessageReader fMessages;
-  std::string fBytes;  // the serialised namespace received so far
+  TPlugInAnswer fAnswer;
   TWords fWords;
   std::string fLog;
 
-  EStage fStage = EStage::kOpen;
-  std::optional<std::string> fProvider;  // the provider that is filling its namespace
-  TClock::time_point fStageBegan = TClock::now();
-  std::optional<TClock::time_point> fDeadline;  // for loading or filling
-  std::optional<TClock::time_point> fGiveUpAt;  // when to stop waiting for the supervisor or the process
-  bool fHasLoaded = false, fHasEnded = false;
+  std::optional<TClock::time_point> fDeadline;  // of the load or the fill
+  std::optional<TClock::time_point> fGiveUpAt;  // when the supervisor or the process is waited for no longer
+  bool fIsInFillTime = false, fHasEnded = false;
   EEnding fEnding = EEnding::kNone;
-  std::string fWhyBad;                     // the reason for kBadAnswer
-  std::optional<std::string> fExitStatus;  // passed to exit by the plug-in
-  std::optional<std::string> fFatal;       // an exception that ended the process
   std::optional<TVerdict> fVerdict;
 };
 

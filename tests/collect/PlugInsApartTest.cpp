@@ -15,6 +15,7 @@
 #include <algorithm>
 #include <cstdio>
 #include <memory>
+#include <thread>
 
 namespace NQRVZEP20 {
 namespace {
@@ -60,8 +61,12 @@ protected:
 
   std::string Environment() const { return "LD_LIBRARY_PATH=" + fDir.Path() + " ZEP_MISDEEDS=" + fDir.Path() + " "; }
 
-  TLines List(std::string const& options) const {
-    std::string const command = Environment() + LISTS_PLUG_INS + " --apart " + options + " 2>&1";
+  // `before`: shell commands for the process that then becomes the program.
+  TLines List(std::string const& options, std::string const& before = "") const {
+    return LinesOf(before + Environment() + LISTS_PLUG_INS + " --apart " + options + " 2>&1");
+  }
+
+  static TLines LinesOf(std::string const& command) {
     std::unique_ptr<FILE, int (*)(FILE*)> const pipe(::popen(command.c_str(), "r"), ::pclose);
     TLines lines(1);
     for (int c; (c = std::fgetc(pipe.get())) != EOF;)
@@ -164,6 +169,120 @@ TEST_F(PlugInsApartMisdeedTest, NoProcessOutlivesTheOwner) {
   }
 }
 
+TEST_F(PlugInsApartMisdeedTest, APlugInThatHarmsItsSupervisorLeavesNoProcess) {
+  Add({"KillsItsSupervisor", "StopsItsSupervisor", "Healthy"});
+  TLines const lines = List("--timeout 6 --parallel 8 --state");
+  EXPECT_THAT(lines, Contains(InFill("KillsItsSupervisor", "its supervisor process died")));
+  EXPECT_THAT(lines, Contains(InFill("StopsItsSupervisor", "it exceeded the time limit of 6 s")));
+  EXPECT_THAT(lines, Contains(Filled("Healthy")));
+  EXPECT_THAT(lines, Contains("children left: 0"));
+  ExpectNoProcess("KillsItsSupervisor");
+  ExpectNoProcess("StopsItsSupervisor");
+}
+
+TEST_F(PlugInsApartMisdeedTest, TheOwnerKeepsNeitherDescriptorsNorChildren) {
+  Add({"Throws", "Crashes", "Exits", "Closes", "LoadThrows", "LoadCrashes", "Forks", "Healthy", "KillsItsSupervisor"});
+  TLines const lines = List("--state");
+  EXPECT_THAT(lines, Contains("descriptors left: 0"));
+  EXPECT_THAT(lines, Contains("children left: 0"));
+}
+
+// ---- Time limits ----
+
+TEST_F(PlugInsApartMisdeedTest, MessagesOfAPlugInDoNotExtendItsTime) {
+  Add({"SaysLoaded", "SaysDone"});
+  TLines const lines = List("--timeout 6 --parallel 2");
+  EXPECT_THAT(lines, Contains(InFill("SaysLoaded", "it exceeded the time limit of 6 s")));
+  EXPECT_THAT(lines, Contains("provider SaysDone: not filled, because it was registered after the plug-in had been loaded (fill, "
+                              "libSaysDone.nsp.so)"));
+}
+
+TEST_F(PlugInsApartMisdeedTest, TheTimeInWhichTheOwnerIsStoppedDoesNotCount) {
+  Add({"AnswersLate"});
+  std::thread stop([this] {
+    for (int tries = 0; ReadFile(fDir.Path("AnswersLate")).empty() && tries < 6000; ++tries) ::usleep(10000);
+    ::usleep(500'000);  // the owner has read that the plug-in is loaded
+    pid_t const owner = std::stoi(ReadFile(fDir.Path("owner")));
+    ::kill(owner, SIGSTOP);
+    ::sleep(8);
+    ::kill(owner, SIGCONT);
+  });
+  TLines const lines = List("--timeout 6", "echo $$ > " + fDir.Path("owner") + "; exec env ");
+  stop.join();
+  EXPECT_THAT(lines, Contains("provider AnswersLate: filled root/own (1)"));
+}
+
+TEST_F(PlugInsApartMisdeedTest, PlugInsWorkSideBySide) {
+  Add({"WaitsForA", "WaitsForB"});
+  TLines const lines = List("--timeout 30 --parallel 2");
+  EXPECT_THAT(lines, Contains(Filled("WaitsForA")));
+  EXPECT_THAT(lines, Contains(Filled("WaitsForB")));
+}
+
+// ---- Resources that are short ----
+
+TEST_F(PlugInsApartMisdeedTest, StandardDescriptorsOfTheOwnerMayBeClosed) {
+  Add({"Prints", "Reads", "Healthy"});
+  TLines const lines = LinesOf(Environment() + LISTS_PLUG_INS + " --apart --timeout 20 <&- 2>&-");
+  EXPECT_THAT(lines, Contains(Filled("Healthy")));
+  EXPECT_THAT(lines, Contains("words Prints: words of 17 bytes"));
+  EXPECT_THAT(lines, Contains("words Reads: read -1"));
+}
+
+// The owner has as many descriptors as it needs for the pipes, and no other.
+TEST_F(PlugInsApartMisdeedTest, ThePlugInNeedsNoDescriptorsOfItsOwner) {
+  if (kIsSanitized) GTEST_SKIP() << "a sanitizer has descriptors of its own";
+  Add({"Crashes", "Healthy", "Reads"});
+  auto const withLimit = [this](int limit) {
+    return List("--timeout 20 --parallel 1", "ulimit -n " + std::to_string(limit) + "; echo data | ");
+  };
+  TLines lines;
+  for (int limit = 8; limit < 100 && !testing::Value(lines, Contains(HasSubstr("Healthy: filled"))); ++limit) {
+    lines = withLimit(limit);
+    ASSERT_THAT(lines, testing::Not(Contains(HasSubstr("time limit"))));
+  }
+  EXPECT_THAT(lines, Contains(Filled("Healthy")));
+  EXPECT_THAT(lines, Contains("words Reads: read -1"));
+  EXPECT_THAT(lines, Contains(InFill("Crashes", "it was killed by SIGSEGV (Segmentation fault)",
+                                     "; last log line: [Error] about to crash")));
+}
+
+// The owner and the supervisor are the two processes that the user may have.
+TEST_F(PlugInsApartMisdeedTest, AProcessThatCannotBeStartedIsNamed) {
+  if (::geteuid() != 0) GTEST_SKIP() << "only root can become a user without processes";
+  Add({"Healthy"});
+  fs::permissions(fDir.Path(), fs::perms::group_all, fs::perm_options::add);
+  TLines const lines = List("--parallel 1", "exec setpriv --reuid 54321 --clear-groups prlimit --nproc=2 env ");
+  EXPECT_THAT(lines, Contains(InLoad("Healthy", "no process could be started for it: Resource temporarily unavailable", "open")));
+}
+
+TEST_F(PlugInsApartMisdeedTest, NoCoreDumpIsLeft) {
+  Add({"Crashes", "Aborts", "LoadCrashes", "PrintsItsState"});
+  fs::create_directory(fDir.Path("cores"));
+  std::string const inCores = "cd " + fDir.Path("cores") + " && ulimit -c unlimited; ";
+  LinesOf(inCores + "sh -c 'kill -SEGV $$' 2>&1");
+  bool const areWritten = !fs::is_empty(fDir.Path("cores"));
+  for (auto const& core : fs::directory_iterator(fDir.Path("cores"))) fs::remove(core.path());
+  TLines const lines = List("", inCores);
+  EXPECT_THAT(lines, Contains("words PrintsItsState: core limit 1 of 1, dumpable 1, first without memory 500"));
+  EXPECT_TRUE(fs::is_empty(fDir.Path("cores")));
+  if (!areWritten) GTEST_SKIP() << "this system writes no core dumps into the working directory";
+}
+
+TEST_F(PlugInsApartMisdeedTest, WordsOfTheOwnerAreNotPrintedByAPlugIn) {
+  Add({"Prints"});
+  TLines const lines = List("--words");
+  EXPECT_EQ(lines.front(), "words of the owner, plug-in Prints: ");
+  EXPECT_THAT(lines, Contains("words Prints: words of 17 bytes"));
+}
+
+TEST_F(PlugInsApartMisdeedTest, ALongErrorAndALongLogLineAreCut) {
+  Add({"LogsMuch"});
+  TLines const lines = List("");
+  EXPECT_THAT(lines, Contains(InFill("LogsMuch", std::string(1021, 'y') + "...",
+                                     "; last log line: [Error] begin " + std::string(1007, 'x') + "...")));
+}
+
 TEST_F(PlugInsApartMisdeedTest, AnEndlessAnswerIsCutOff) {
   Add({"AnswersForever", "AnswersBroken"});
   TLines const lines = List("--answer 100000");
@@ -207,7 +326,7 @@ TEST_F(PlugInsApartMisdeedTest, ChangesOfAProcessStayInIt) {
   Add({"ChangesDirectory", "LimitsItself", "Healthy"});
   mode_t const mask = ::umask(0);
   ::umask(mask);
-  TLines const lines = List("--parallel 1 --state");
+  TLines const lines = List("--parallel 1 --state", "unset ZEP_HOST_NAME; ");
   for (char const* name : {"ChangesDirectory", "LimitsItself", "Healthy"}) EXPECT_THAT(lines, Contains(Filled(name)));
   EXPECT_THAT(lines, Contains("directory: " + fs::current_path().string()));
   EXPECT_THAT(lines, Contains("umask: " + std::to_string(mask)));
@@ -225,6 +344,22 @@ TEST_F(PlugInsApartMisdeedTest, OfTwoProvidersWithOneNameTheFirstCounts) {
               Contains("provider RegistersTwice: the plug-in registers this name twice; the second registration is ignored "
                        "(registration, libRegistersTwice.nsp.so)"));
   EXPECT_THAT(lines, Contains("plug-in RegistersNothing: "));
+}
+
+TEST_F(PlugInsApartMisdeedTest, OfTwoProvidersWithOneNameTheSecondCountsWhenTheFirstFails) {
+  Add({"TwinThrows", "TwinZ"});
+  TLines const lines = List("");
+  EXPECT_THAT(lines, Contains("provider Twin: no twin today; the name Twin is also registered by libTwinZ.nsp.so, which "
+                              "comes after it and counts instead (fill, libTwinThrows.nsp.so)"));
+  EXPECT_THAT(lines, Contains("provider Twin: filled root/TwinZ (1)"));
+}
+
+TEST_F(PlugInsApartMisdeedTest, OfTwoProvidersWithOneNameBothAreNamedWhenTheSecondFails) {
+  Add({"TwinA", "TwinThrows"});
+  TLines const lines = List("");
+  EXPECT_THAT(lines, Contains("provider Twin: filled root/TwinA (1)"));
+  EXPECT_THAT(lines, Contains("provider Twin: no twin today; the name Twin is registered by libTwinA.nsp.so, which comes "
+                              "first (fill, libTwinThrows.nsp.so)"));
 }
 
 TEST_F(PlugInsApartMisdeedTest, AProviderThatIsRegisteredDuringTheFillIsNotFilled) {

@@ -8,6 +8,7 @@
 #include "TNamespaceProviderManager.h"
 #include "TRootObject.h"
 #include "TZEPFailure.h"
+#include "collect/process/Messages.h"
 #include "providers/memory/TMemoryClass.h"
 #include "providers/memory/TMemoryNamespace.h"
 #include "providers/memory/TMemoryProvider.h"
@@ -15,6 +16,8 @@
 #include <dlfcn.h>
 #include <fcntl.h>
 #include <sys/mman.h>
+#include <sys/prctl.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -79,6 +82,49 @@ void FillMemory() {
     char volatile* const piece = new char volatile[size];
     for (std::size_t at = 0; at < size; at += 4096) piece[at] = 1;
   }
+}
+
+// ---- The supervisor and the pipe of the answer ----
+
+// Leaves a process behind, and hangs without a supervisor.
+void HarmSupervisor(int signal) {
+  StartDaemon(OwnName());
+  ::kill(::getppid(), signal);
+  HangHere();
+}
+
+// The pipe with the highest number.
+int AnswerPipe() {
+  struct stat status {};
+  for (int fd = 2000; fd > 2; --fd)
+    if (::fstat(fd, &status) == 0 && S_ISFIFO(status.st_mode)) return fd;
+  return -1;
+}
+
+void SendMessage(EMessage kind, std::string const& text) {
+  auto const length = static_cast<std::uint32_t>(text.size());
+  std::string bytes(1, static_cast<char>(kind));
+  bytes.append(reinterpret_cast<char const*>(&length), sizeof length);
+  bytes += text;
+  [[maybe_unused]] ssize_t const written = ::write(AnswerPipe(), bytes.data(), bytes.size());
+}
+
+[[noreturn]] void SayLoadedForEver() {
+  for (;;) SendMessage(EMessage::kLoaded, "1"), ::usleep(50'000);
+}
+
+// ---- State of the process ----
+
+void PrintState() {
+  rlimit core{};
+  ::getrlimit(RLIMIT_CORE, &core);
+  std::cout << "core limit " << core.rlim_cur << " of " << core.rlim_max << ", dumpable " << ::prctl(PR_GET_DUMPABLE)
+            << ", first without memory " << std::ifstream("/proc/self/oom_score_adj").rdbuf();
+}
+
+void WaitForFile(std::string const& name) {
+  struct stat status {};
+  while (::stat(FileOf(name).c_str(), &status) != 0) ::usleep(1000);
 }
 
 // Enumerates one instance for ever.
@@ -208,6 +254,16 @@ std::map<std::string, TMisdeed> const kWhileFilling = {
     {"Forks", [] { StartDaemon("Forks"); }},
     {"ForksTwice", [] { [[maybe_unused]] pid_t const copy = ::fork(); }},
     {"Reads", [] { std::cout << "read " << std::cin.get() << std::endl; }},
+    {"KillsItsSupervisor", [] { HarmSupervisor(SIGKILL); }},
+    {"StopsItsSupervisor", [] { HarmSupervisor(SIGSTOP); }},
+    {"SaysDone", [] { SendMessage(EMessage::kDone, ""), HangHere(); }},
+    {"SaysLoaded", [] { SayLoadedForEver(); }},
+    {"PrintsItsState", PrintState},
+    {"WaitsForB", [] { LeaveProcessId("A"), WaitForFile("B"); }},
+    {"WaitsForA", [] { LeaveProcessId("B"), WaitForFile("A"); }},
+    {"TwinThrows", [] { throw std::runtime_error("no twin today"); }},
+    {"AnswersLate", [] { LeaveProcessId("AnswersLate"), ::sleep(1); }},
+    {"LogsMuch", [] { Log(("begin " + std::string(5000, 'x')).c_str()), throw std::runtime_error(std::string(5000, 'y')); }},
     {"LimitsItself", [] { ::umask(0777), ::setenv("ZEP_HOST_NAME", "wrong", 1); }},
 };
 
@@ -231,6 +287,7 @@ public:
   }
   boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) override {
     if (OwnName() == "AnswersForever") return NamespaceWith<TEndlessClass>(1024 * 1024);
+    if (OwnName() == "AnswersLate") return TMemoryProvider::GetNamespace(context), NamespaceWith<TMemoryClass>(32 * 1024 * 1024);
     if (OwnName() == "AnswersBroken") return NamespaceWith<TBrokenClass>(0);
     return TMemoryProvider::GetNamespace(context);
   }

@@ -31,5 +31,12 @@ TEST(LogLinesTest, TheLastLineIsThatOfTheLastEntry) {
   EXPECT_EQ(LastLogLineOf(""), "");
 }
 
+TEST(LogLinesTest, TheLastLineIsCutAndSearchedNearTheEnd) {
+  std::string const entry = "FDR_[Error] 3/3/2024  9:5:7 ";
+  EXPECT_EQ(LastLogLineOf(entry + std::string(5000, 'x')), "[Error] " + std::string(1013, 'x') + "...");
+  EXPECT_EQ(LastLogLineOf(std::string(100'000, '\n') + entry + "no disk\n"), "[Error] no disk");
+  EXPECT_EQ(LastLogLineOf(entry + "no disk\n" + std::string(100'000, '\n')), "");
+}
+
 }  // namespace
 }  // namespace NQRVZEP20

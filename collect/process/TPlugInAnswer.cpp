@@ -1,0 +1,167 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/process/TPlugInAnswer.h"
+
+#include "collect/FailureOf.h"
+#include "collect/SafeText.h"
+#include "collect/answer/TReceivedNamespace.h"
+
+#include <algorithm>
+#include <charconv>
+
+namespace NQRVZEP20 {
+
+TPlugInAnswer::TPlugInAnswer(std::string const& name, std::string const& file, TApartLimits const& limits,
+                             std::string sampleLabel, std::function<std::string()> lastLogLine)
+    : fLimits(limits),
+      fSampleLabel(std::move(sampleLabel)),
+      fLastLogLine(std::move(lastLogLine)),
+      fResult{name, file, 0, "", {}} {}
+
+void TPlugInAnswer::Add(std::string_view bytes) {
+  if (fState != EState::kOpen) return;
+  fMessages.Add(bytes);
+  while (fState == EState::kOpen) {
+    auto const message = fMessages.Next();
+    if (!message) break;
+    Take(*message);
+  }
+  if (fMessages.IsBad()) Refuse("malformed message");
+}
+
+void TPlugInAnswer::Take(TMessage const& message) {
+  std::string const& text = message.fText;
+  fOtherBytes += kMessageHead + (message.fKind == EMessage::kBytes ? 0 : text.size());
+  if (fOtherBytes > kMostOtherBytes) return Refuse("its messages exceed " + std::to_string(kMostOtherBytes) + " bytes");
+  switch (message.fKind) {
+    case EMessage::kStage:
+      return Begin(static_cast<EStage>(text.empty() ? '\0' : text[0]));
+    case EMessage::kRegistered:
+    case EMessage::kTaken:
+    case EMessage::kFilling:
+      return TakeName(message);
+    case EMessage::kLoaded:
+      return TakeLoaded(text);
+    case EMessage::kBytes:
+      fAnswerBytes += text.size();
+      if (fAnswerBytes <= fLimits.fAnswerBytes)
+        fBytes += text;
+      else
+        fState = EState::kTooLong;
+      return;
+    case EMessage::kFilled:
+      return TakeNamespace(text);
+    case EMessage::kFailed:
+      return Fail(text);
+    case EMessage::kFatal:
+      fEnding = text;
+      return;
+    case EMessage::kExits:
+      fEnding = "it exited with status " + text;
+      return;
+    case EMessage::kDone:
+      fState = EState::kDone;
+      return;
+  }
+}
+
+void TPlugInAnswer::TakeName(TMessage const& message) {
+  std::string const& name = message.fText;
+  if (name.size() > kLongestName)
+    return Refuse("the name of a provider has more than " + std::to_string(kLongestName) + " bytes");
+  if (message.fKind == EMessage::kFilling) {
+    fProvider = name;
+    fBytes.clear();
+    return Begin(EStage::kFill);
+  }
+  if (message.fKind == EMessage::kRegistered)
+    AddRun(name);
+  else if (HasRoomForARun())
+    fResult.fProviders.push_back(
+        {name, nullptr, 0, "the plug-in registers this name twice; the second registration is ignored", NameOf(EStage::kRegistration), ""});
+}
+
+void TPlugInAnswer::TakeLoaded(std::string const& microseconds) {
+  if (fHasLoaded) return;
+  fResult.fMilliseconds = MillisecondsIn(microseconds).value_or(0);
+  fHasLoaded = true;
+}
+
+void TPlugInAnswer::TakeNamespace(std::string const& microseconds) {
+  auto const milliseconds = MillisecondsIn(microseconds);
+  TProviderRun* const run = milliseconds ? CurrentRun() : nullptr;
+  if (run == nullptr) return;
+  run->fMilliseconds = *milliseconds;
+  std::string const failure = FailureOf([&] {
+    auto const ns = TReceivedNamespace::From(std::move(fBytes), fCounts);
+    run->fView = std::make_shared<TNamespaceView>(run->fName, ns, fSampleLabel);
+  });
+  if (!failure.empty()) Fail(failure);
+  fBytes = std::string();
+  fProvider.reset();
+}
+
+void TPlugInAnswer::Fail(std::string why) {
+  if (!fProvider && !fResult.fError.empty()) return;
+  bool const isOutOfMemory = fLimits.fMemoryMebibytes != 0 && why.find("std::bad_alloc") != why.npos;
+  if (isOutOfMemory) why += " (the memory limit is " + std::to_string(fLimits.fMemoryMebibytes) + " MiB)";
+  TProviderRun* const run = CurrentRun();
+  (run != nullptr ? run->fError : fResult.fError) = Shortened(why, kLongestFailure);
+  (run != nullptr ? run->fStage : fResult.fStage) = NameOf(run != nullptr ? EStage::kFill : fStage);
+  (run != nullptr ? run->fLastLogLine : fResult.fLastLogLine) = fLastLogLine();
+  if (run != nullptr) fProvider.reset();
+}
+
+TPlugIn TPlugInAnswer::Finish(std::string words) {
+  for (TProviderRun& run : fResult.fProviders)
+    if (!run.fView && run.fError.empty()) {
+      run.fError = fState == EState::kDone ? "not filled, because it was registered after the plug-in had been loaded"
+                                           : "not filled, because the plug-in process had ended";
+      run.fStage = NameOf(EStage::kFill);
+    }
+  fResult.fWords = std::move(words);
+  return std::move(fResult);
+}
+
+void TPlugInAnswer::Begin(EStage stage) {
+  fStage = std::min(stage, EStage::kFill);
+  fStageBegan = TClock::now();
+}
+
+void TPlugInAnswer::Refuse(std::string why) {
+  fState = EState::kBad;
+  fWhyBad = std::move(why);
+}
+
+std::optional<double> TPlugInAnswer::MillisecondsIn(std::string const& microseconds) {
+  std::uint64_t number = 0;
+  char const* const end = microseconds.data() + microseconds.size();
+  auto const [last, error] = std::from_chars(microseconds.data(), end, number);
+  if (error == std::errc() && last == end) return static_cast<double>(number) / 1000;
+  Refuse("a time is not a number");
+  return std::nullopt;
+}
+
+bool TPlugInAnswer::HasRoomForARun() {
+  if (fResult.fProviders.size() < kMostProviders) return true;
+  Refuse("it registers more than " + std::to_string(kMostProviders) + " providers");
+  return false;
+}
+
+// In the order of the names, in which the providers fill their namespaces.
+TProviderRun* TPlugInAnswer::AddRun(std::string const& name) {
+  if (!HasRoomForARun()) return nullptr;
+  auto& runs = fResult.fProviders;
+  auto const place =
+      std::find_if(runs.begin(), runs.end(), [&](TProviderRun const& run) { return run.fName >= name && run.fError.empty(); });
+  return &*runs.insert(place, {name, nullptr, 0, ""});
+}
+
+// The row of the provider that is filling its namespace, if one is.
+TProviderRun* TPlugInAnswer::CurrentRun() {
+  if (!fProvider) return nullptr;
+  for (TProviderRun& run : fResult.fProviders)
+    if (run.fName == *fProvider && run.fError.empty() && !run.fView) return &run;
+  return AddRun(*fProvider);
+}
+
+}  // namespace NQRVZEP20
