@@ -25,8 +25,8 @@ namespace NQRVZEP20 {
 //   the ending of the classes
 //   for each root class: records (ERecord), which end with kEnd
 //
-// Only root classes are asked for instances: ICIMClass::EnumerateInstances visits those of the classes below, too. An instance that
-// a provider enumerates for a class, but not for its root class, is missing.
+// Only root classes are asked for instances: ICIMClass::EnumerateInstances visits those of the classes below, too. An instance
+// that a provider enumerates for a class, but not for its root class, is missing.
 //
 // A qualifier is its name, the number of its declaration plus 1 or 0, the flavor and the value. A declaration is the number of
 // its class plus 1, and its number in that class; or 0. An ending is 0, or 1 and the failure of the enumeration.

@@ -57,7 +57,7 @@ public:
 
   TFacts const& Facts() const { return fFacts; }
   std::vector<boost::shared_ptr<TReceivedPropertyDecl>> const& PropertyDecls() const { return fPropertyDecls; }
-  boost::shared_ptr<TReceivedPropertyDecl> FindPropertyDecl(std::string const& name) const;  // its own; empty when there is none
+  boost::shared_ptr<TReceivedPropertyDecl> FindPropertyDecl(std::string const& name) const;  // its own; empty if there is none
   void Add(boost::shared_ptr<TReceivedPropertyDecl> property);
   void Add(boost::shared_ptr<TReceivedMethodDecl> method) { fMethodDecls.push_back(method); }
   void Add(boost::shared_ptr<TReceivedProperty> staticProperty) { fStaticProperties.push_back(staticProperty); }

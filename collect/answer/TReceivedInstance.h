@@ -27,7 +27,7 @@ public:
                            TCIMContext const& context) const override;
   TCIMReference GetPath(TCIMContext const& context) const override;
 
-  TReceivedLayout const& Layout() const { return *fLayout; }  // as long as the namespace exists
+  TReceivedLayout const& Layout() const { return *fLayout; }  // valid as long as the namespace exists
   std::size_t At() const { return fAt; }
 
   // The position of each value, and of the path after them.

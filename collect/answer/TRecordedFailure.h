@@ -12,7 +12,7 @@ class TByteWriter;
 // TZEPFailure also with its reason, any other std::exception with its message, or an exception of any other type.
 class TRecordedFailure {
 public:
-  static TRecordedFailure OfCurrentException();           // call it in a handler; passes on std::bad_alloc
+  static TRecordedFailure OfCurrentException();           // call it in a catch block; rethrows std::bad_alloc
   static TRecordedFailure ReadFrom(TByteReader& reader);  // a long text is cut (AnswerLimits.h)
   void WriteTo(TByteWriter& writer) const;
 

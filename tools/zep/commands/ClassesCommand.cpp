@@ -11,6 +11,7 @@
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"
+#include "tools/zep/output/PlugInRows.h"
 #include "tools/zep/output/Text.h"
 
 #include <CLI/CLI.hpp>
@@ -80,6 +81,7 @@ std::string AsText(std::vector<TNamespaceClasses> const& namespaces, bool asTree
 struct TClasses {
   std::vector<TNamespaceClasses> fNamespaces;
   std::vector<std::string> fFailures;  // of the providers
+  TJson fFailedPlugIns;
   std::string fSampleLabel;            // empty without a sample
 
   bool IsEmpty() const {
@@ -97,6 +99,7 @@ struct TClasses {
 
 std::string AsJson(TClasses const& found) {
   TJson document = DocumentHead("zep classes", found.ExitStatus(), Joined(found.Reasons(), "; "), found.fSampleLabel);
+  document["failedPlugIns"] = found.fFailedPlugIns;
   document["namespaces"] = TJson::array();
   for (TNamespaceClasses const& ns : found.fNamespaces) {
     TJson classes = TJson::array();
@@ -119,6 +122,7 @@ TClasses FindClasses(TArguments const& arguments) {
   std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugInsFor(arguments.fPlugIns, sample);
   classes.fSampleLabel = sample ? sample->fLabel : "";
   classes.fFailures = FailuresOf(plugIns);
+  classes.fFailedPlugIns = FailedPlugInsAsJson(plugIns);
   for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
     std::string const failure = FailureOf([&] {
       classes.fNamespaces.push_back({view.GetProviderName(), view.GetName(), view.GetSampleLabel(), ClassesOf(*view.Get())});

@@ -20,6 +20,7 @@
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"
+#include "tools/zep/output/PlugInRows.h"
 #include "tools/zep/output/Text.h"
 
 #include <CLI/CLI.hpp>
@@ -257,49 +258,71 @@ std::string ElementAsText(TNamespaceView const& view, boost::shared_ptr<ICIMElem
       [&](boost::shared_ptr<ICIMClass const> cls) { return ClassAsText(view, cls); });
 }
 
-std::string ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElement> const& element) {
-  TJson document = DocumentHead("zep show", kExitComplete, "", view.GetSampleLabel());
-  document["object"] = ForElement(
+TJson ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElement> const& element) {
+  return ForElement(
       element, [&](ICIMInstance const& instance) { return InstanceAsJson(view, instance); },
       [&](boost::shared_ptr<ICIMClass const> cls) { return ClassAsJson(view, cls); });
-  return AsText(document);
 }
 
 struct TSearch {
-  std::string fText;                   // the object as it is printed; empty when there is none
+  bool fIsFound = false;
+  std::string fText;                   // the object as it is printed
+  TJson fObject;                       // the same for a document; only with --json
+  std::string fSampleLabel;            // empty without a sample
   std::vector<std::string> fFailures;  // of the providers
+  TJson fFailedPlugIns;
+
+  EExitStatus ExitStatus() const { return !fIsFound ? kExitNothing : fFailures.empty() ? kExitComplete : kExitPartial; }
 };
 
-TSearch Search(TArguments const& arguments, std::optional<TSample> const& sample) {
+TSearch Search(TArguments const& arguments) {
   TSearch search;
   bool const isMof = !arguments.fMofFile.empty();
+  auto const sample = SampleIf(arguments.fSample);
   std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugInsFor(arguments.fPlugIns, sample);
+  search.fSampleLabel = sample ? sample->fLabel : "";
   search.fFailures = FailuresOf(plugIns);
+  search.fFailedPlugIns = FailedPlugInsAsJson(plugIns);
   for (TNamespaceView const& view : isMof ? std::vector{ViewOfMof(arguments.fMofFile)} : ViewsOf(plugIns)) {
     std::string const failure = FailureOf([&] {
       auto const element = Find(view, arguments.fPath);
-      if (element) search.fText = arguments.fAsJson ? ElementAsJson(view, element) : ElementAsText(view, element);
+      if (!element) return;
+      if (arguments.fAsJson)
+        search.fObject = ElementAsJson(view, element);
+      else
+        search.fText = ElementAsText(view, element);
+      search.fIsFound = true;
     });
-    if (!search.fText.empty()) break;
+    if (search.fIsFound) break;
     if (!failure.empty()) search.fFailures.push_back(view.GetProviderName() + ": " + failure);
   }
   return search;
 }
 
+std::vector<std::string> ReasonsOf(TSearch const& search, TArguments const& arguments) {
+  std::vector<std::string> reasons = search.fFailures;
+  if (!search.fIsFound)
+    reasons.push_back((arguments.fMofFile.empty() ? "no provider has the" : arguments.fMofFile + " has no") + " object \"" +
+                      arguments.fPath + "\"");
+  return reasons;
+}
+
+std::string AsJson(TSearch const& search, std::string const& reason) {
+  TJson document = DocumentHead("zep show", search.ExitStatus(), reason, search.fSampleLabel);
+  document["failedPlugIns"] = search.fFailedPlugIns;
+  if (search.fIsFound) document["object"] = search.fObject;
+  return search.fIsFound ? AsText(document) : AsLine(document);
+}
+
 int Show(TArguments const& arguments) {
-  auto const sample = SampleIf(arguments.fSample);
-  TSearch search = Search(arguments, sample);
-  if (!search.fText.empty()) {
-    WriteOutput(search.fText);
-    return kExitComplete;
-  }
-  std::vector<std::string>& reasons = search.fFailures;
-  reasons.push_back((arguments.fMofFile.empty() ? "no provider has the" : arguments.fMofFile + " has no") + " object \"" +
-                    arguments.fPath + "\"");
+  TSearch const search = Search(arguments);
+  std::vector<std::string> const reasons = ReasonsOf(search, arguments);
   if (arguments.fAsJson)
-    WriteOutput(FailureAsJson("zep show", kExitNothing, Joined(reasons, "; "), sample ? sample->fLabel : ""));
+    WriteOutput(AsJson(search, Joined(reasons, "; ")));
+  else if (search.fIsFound)
+    WriteOutput(search.fText);
   for (std::string const& reason : reasons) std::cerr << "zep: " << Printable(reason) << "\n";
-  return kExitNothing;
+  return search.ExitStatus();
 }
 
 }  // namespace
@@ -314,7 +337,9 @@ TRun AddShowArguments(CLI::App& command) {
       ->excludes(mof);
   AddPlugInOptions(command, arguments->fPlugIns);
   command.get_option("--plugin")->excludes(mof);
-  command.footer("Exit status: 0 when there is such an object, 1 when there is none, 64 for wrong usage.");
+  command.footer(
+      "Exit status: 0 when there is such an object, 2 when there is but a plug-in failed, 1 when there is none,\n"
+      "64 for wrong usage.");
   return [arguments] { return Show(*arguments); };
 }
 

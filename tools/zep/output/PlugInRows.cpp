@@ -42,4 +42,11 @@ TJson PlugInAsJson(TPlugIn const& plugIn) {
           {"words", OrNull(plugIn.fWords)}, {"providers", providers}};
 }
 
+TJson FailedPlugInsAsJson(std::vector<TPlugIn> const& plugIns) {
+  TJson json = TJson::array();
+  for (TPlugIn const& plugIn : plugIns)
+    if (plugIn.HasFailed()) json.push_back(PlugInAsJson(plugIn));
+  return json;
+}
+
 }  // namespace NQRVZEP20::zep

@@ -5,6 +5,7 @@
 #include "tools/zep/output/Json.h"
 
 #include <string>
+#include <vector>
 
 namespace NQRVZEP20::zep {
 
@@ -16,5 +17,8 @@ std::string TimeTextOf(TPlugIn const& plugIn);
 
 // A plug-in and its providers, for a document.
 TJson PlugInAsJson(TPlugIn const& plugIn);
+
+// An array of those that failed, or of which a provider failed.
+TJson FailedPlugInsAsJson(std::vector<TPlugIn> const& plugIns);
 
 }  // namespace NQRVZEP20::zep

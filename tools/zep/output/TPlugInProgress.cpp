@@ -3,6 +3,8 @@
 
 #include "tools/zep/output/Text.h"
 
+#include <unistd.h>
+
 #include <cstdio>
 #include <iostream>
 
@@ -13,6 +15,11 @@ namespace {
 constexpr double kSlowSeconds = 0.5;
 constexpr std::size_t kMostCharacters = 79;  // fits every terminal
 
+bool IsInBackground() {
+  pid_t const group = ::tcgetpgrp(STDERR_FILENO);
+  return group >= 0 && group != ::getpgrp();
+}
+
 std::string PhraseOf(TPlugInAtWork const& plugIn) {
   char seconds[32];
   std::snprintf(seconds, sizeof seconds, "%.1f s", plugIn.fSeconds);
@@ -20,6 +27,11 @@ std::string PhraseOf(TPlugInAtWork const& plugIn) {
 }
 
 }  // namespace
+
+// A process in the background would be stopped by SIGTTOU on a terminal that is set so (stty tostop).
+void TPlugInProgress::Show(std::vector<TPlugInAtWork> const& atWork) {
+  if (!IsInBackground()) Write(TextFor(atWork));
+}
 
 std::string TPlugInProgress::TextFor(std::vector<TPlugInAtWork> const& atWork) {
   std::vector<TPlugInAtWork> slow;

@@ -6,6 +6,7 @@
 
 #include <gmock/gmock.h>
 #include <pty.h>
+#include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -106,6 +107,8 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
       {"Aborts", "fill", "it was killed by SIGABRT (Aborted)", nullptr},
       {"Exits", "fill", "it exited with status 0", nullptr},
       {"ExitsAtOnce", "fill", "it exited with status 7", nullptr},
+      {"Kills", "fill", "it was killed by SIGTERM (Terminated)", nullptr},
+      {"KillsItsSupervisor", "fill", "its supervisor process died", nullptr},
       {"Executes", "fill", "it exited with status 9", nullptr},
       {"Closes", "fill", "it closed the descriptor for its result", nullptr},
       {"LoadThrows", "static construction", "no disk today", nullptr},
@@ -130,6 +133,34 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
   for (char const* name : {"ChangesDirectory", "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken"})
     EXPECT_TRUE(FailureIn(document, name)["error"].is_null()) << name;
   ExpectNoProcess("Forks");
+  ExpectNoProcess("KillsItsSupervisor");
+}
+
+TEST_F(ProvidersTest, OfTwoPlugInsWithOneNameBothAreNamed) {
+  Add({"TwinA", "TwinB"});
+  TRun const run = Run({"report", "--json"});
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_TRUE(FailureIn(JsonOf(run), "TwinA")["error"].is_null());
+  auto const second = FailureIn(JsonOf(run), "TwinB");
+  EXPECT_EQ(second["error"], "the name Twin is registered by libTwinA.nsp.so, which comes first");
+  EXPECT_EQ(second["stage"], "registration");
+  EXPECT_THAT(JsonOf(run)["reason"].get<std::string>(), HasSubstr("libTwinB.nsp.so"));
+}
+
+TEST_F(ProvidersTest, NoCoreDumpOfAPlugInIsLeft) {
+  Add({"Crashes", "LoadCrashes"});
+  rlimit before{};
+  ::getrlimit(RLIMIT_CORE, &before);
+  rlimit const most{before.rlim_max, before.rlim_max};
+  ::setrlimit(RLIMIT_CORE, &most);
+  TCall call;
+  call.fArguments = {"report"};
+  call.fEnvironment = Environment();
+  call.fDirectory = fZep.Path("bin");
+  EXPECT_EQ(fZep.Run(call).fStatus, 2);
+  ::setrlimit(RLIMIT_CORE, &before);
+  for (auto const& file : fs::directory_iterator(fZep.Path("bin")))
+    EXPECT_NE(file.path().filename().string().rfind("core", 0), 0u) << file.path();
 }
 
 TEST_F(ProvidersTest, TheRowOfAFailureNamesFileProviderStageCauseAndLogLine) {
@@ -143,16 +174,17 @@ TEST_F(ProvidersTest, TheRowOfAFailureNamesFileProviderStageCauseAndLogLine) {
   EXPECT_EQ(Run({"classes"}).fErrors,
             "zep: Crashes: it was killed by SIGSEGV (Segmentation fault) (fill, libCrashes.nsp.so); last "
             "log line: [Error] about to crash\n");
-  EXPECT_EQ(Run({"show", "CIM_Chassis"}).fStatus, 0);
+  EXPECT_EQ(Run({"show", "CIM_Chassis"}).fStatus, 2);
 }
 
 TEST_F(ProvidersTest, PlugInsThatHangOrStopAreEndedAtTheTimeLimit) {
   fZep.Remove("libHost.nsp.so");
-  Add({"Hangs", "HangsBlocked", "Stops", "LoadHangs"});
-  auto const document = JsonOf(Run({"report", "--json", "--plugin-timeout", "2"}));
-  for (char const* name : {"Hangs", "HangsBlocked", "Stops", "LoadHangs"})
-    EXPECT_EQ(FailureIn(document, name)["error"], "it exceeded the time limit of 2 s") << name;
+  Add({"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs"});
+  auto const document = JsonOf(Run({"report", "--json", "--plugin-timeout", "6"}));
+  for (char const* name : {"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs"})
+    EXPECT_EQ(FailureIn(document, name)["error"], "it exceeded the time limit of 6 s") << name;
   EXPECT_EQ(FailureIn(document, "LoadHangs")["stage"], "static construction");
+  EXPECT_EQ(FailureIn(document, "RegistrationHangs")["stage"], "registration");
   ExpectNoProcess("Hangs");
   ExpectNoProcess("HangsBlocked");
 }
@@ -190,13 +222,13 @@ TEST_F(ProvidersTest, AnInterruptLeavesNoProcess) {
   ExpectNoProcess("Hangs");
 }
 
-// What zep writes to a terminal.
-std::string OnTerminal(std::string const& program, std::map<std::string, std::string> const& environment) {
+// What the shell command of zep writes to a terminal.
+std::string OnTerminal(std::string const& command, std::map<std::string, std::string> const& environment) {
   int terminal = -1;
   pid_t const zep = ::forkpty(&terminal, nullptr, nullptr, nullptr);
   if (zep == 0) {
     for (auto const& [name, value] : environment) ::setenv(name.c_str(), value.c_str(), 1);
-    ::execl(program.c_str(), "zep", "classes", "--plugin-timeout", "2", nullptr);
+    ::execl("/bin/sh", "sh", "-c", command.c_str(), nullptr);
     ::_exit(127);
   }
   std::string text;
@@ -210,13 +242,16 @@ std::string OnTerminal(std::string const& program, std::map<std::string, std::st
 TEST_F(ProvidersTest, ProgressIsShownOnATerminalOnly) {
   Add({"LoadHangs"});
   auto environment = Environment();
+  std::string const command = fZep.Path("bin/zep") + " classes --plugin-timeout 6";
   environment["TERM"] = "xterm";
-  EXPECT_THAT(OnTerminal(fZep.Path("bin/zep"), environment), HasSubstr("\r\x1b[KLoadHangs: static construction, "));
+  EXPECT_THAT(OnTerminal(command, environment), HasSubstr("\r\x1b[KLoadHangs: static construction, "));
+  EXPECT_THAT(OnTerminal("set -m; " + command + " & wait", environment),
+              AllOf(HasSubstr("LoadHangs: it exceeded"), testing::Not(HasSubstr("LoadHangs: static construction"))));
   environment["TERM"] = "dumb";
-  std::string const dumb = OnTerminal(fZep.Path("bin/zep"), environment);
+  std::string const dumb = OnTerminal(command, environment);
   EXPECT_THAT(dumb, HasSubstr("LoadHangs: static construction, "));
   EXPECT_EQ(dumb.find('\x1b'), dumb.npos);
-  EXPECT_THAT(Run({"classes", "--plugin-timeout", "2"}).fErrors, testing::Not(HasSubstr("LoadHangs: static construction")));
+  EXPECT_THAT(Run({"classes", "--plugin-timeout", "6"}).fErrors, testing::Not(HasSubstr("LoadHangs: static construction")));
 }
 
 }  // namespace

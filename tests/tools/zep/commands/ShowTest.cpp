@@ -189,9 +189,27 @@ TEST_F(ShowTest, AProviderThatFailedIsNamed) {
   EXPECT_EQ(Run({"show", "X_None"}).fErrors,
             "zep: Broken: " + fZep.Path("bin/../lib/libBroken.nsp.so") +
                 ": file too short (open, libBroken.nsp.so)\nzep: no provider has the object \"X_None\"\n");
-  TRun const run = Run({"show", "X_Odd"});
-  EXPECT_EQ(run.fStatus, 0);
-  EXPECT_EQ(run.fErrors, "");
+}
+
+TEST_F(ShowTest, AFailedPlugInIsReportedAlsoWhenTheObjectIsFound) {
+  WriteFile(fZep.Path("lib/libBroken.nsp.so"), "this is no library");
+  std::string const error = fZep.Path("bin/../lib/libBroken.nsp.so") + ": file too short";
+  for (char const* command : {"show", "classes"}) {
+    std::vector<std::string> arguments = {command};
+    if (arguments[0] == "show") arguments.emplace_back("X_Odd");
+    TRun const run = Run(arguments);
+    EXPECT_EQ(run.fStatus, 2);
+    EXPECT_THAT(run.fOutput, HasSubstr("X_Odd"));
+    EXPECT_EQ(run.fErrors, "zep: Broken: " + error + " (open, libBroken.nsp.so)\n");
+    arguments.emplace_back("--json");
+    auto const document = JsonOf(Run(arguments));
+    EXPECT_EQ(document["exitStatus"], 2);
+    EXPECT_EQ(document["reason"], "Broken: " + error + " (open, libBroken.nsp.so)");
+    ASSERT_EQ(document["failedPlugIns"].size(), 1u);
+    EXPECT_EQ(document["failedPlugIns"][0]["name"], "Broken");
+    EXPECT_EQ(document["failedPlugIns"][0]["error"], error);
+    EXPECT_EQ(document["failedPlugIns"][0]["stage"], "open");
+  }
 }
 
 TEST_F(ShowTest, ClassesNamesANamespaceThatFailsAndShowsTheOthers) {
