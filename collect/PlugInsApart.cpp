@@ -152,8 +152,10 @@ struct TClaim {
   TProviderRun* fRun;
 };
 
-// The claims of other files than the first are refused, or noted where they failed anyway. The name belongs to the first one that
-// has not failed.
+std::string TakenBy(TClaim const& claim) { return "the name " + claim.fRun->fName + " is already registered by " + claim.fFile; }
+
+// The name belongs to the first file whose provider has not failed. The rows of the others name it, and so does the row of the
+// first file, if its provider has failed.
 void Settle(std::vector<TClaim> const& claims) {
   TClaim const& first = claims.front();
   auto const hasView = [](TClaim const& claim) { return claim.fRun->fView != nullptr; };
@@ -161,12 +163,11 @@ void Settle(std::vector<TClaim> const& claims) {
   for (TClaim const& claim : claims) {
     TProviderRun& run = *claim.fRun;
     if (claim.fFile == first.fFile) continue;
-    std::string const why = "the name " + run.fName + " is registered by " + first.fFile + ", which comes first";
     if (!hasView(claim)) {
-      run.fError += "; " + why;
+      run.fError += "; " + TakenBy(first);
     } else if (claim.fFile != owner->fFile) {
       run.fView.reset();
-      run.fError = "the name " + run.fName + " is registered by " + owner->fFile + ", which comes first";
+      run.fError = TakenBy(*owner);
       run.fStage = NameOf(EStage::kRegistration);
     }
   }
@@ -174,8 +175,8 @@ void Settle(std::vector<TClaim> const& claims) {
   if (second == claims.end() || hasView(first)) return;
   bool const isOwner = owner != claims.end() && owner->fFile != first.fFile;
   TClaim const& other = isOwner ? *owner : *second;
-  first.fRun->fError += "; the name " + first.fRun->fName + " is also registered by " + other.fFile + ", which comes after it" +
-                        (isOwner ? " and counts instead" : "");
+  first.fRun->fError +=
+      "; the name " + first.fRun->fName + " is then registered by " + other.fFile + (isOwner ? ", which is used instead" : "");
 }
 
 void SettleNames(std::vector<TPlugIn>& plugIns) {

@@ -349,8 +349,8 @@ TEST_F(PlugInsApartMisdeedTest, OfTwoProvidersWithOneNameTheFirstCounts) {
 TEST_F(PlugInsApartMisdeedTest, OfTwoProvidersWithOneNameTheSecondCountsWhenTheFirstFails) {
   Add({"TwinThrows", "TwinZ"});
   TLines const lines = List("");
-  EXPECT_THAT(lines, Contains("provider Twin: no twin today; the name Twin is also registered by libTwinZ.nsp.so, which "
-                              "comes after it and counts instead (fill, libTwinThrows.nsp.so)"));
+  EXPECT_THAT(lines, Contains("provider Twin: no twin today; the name Twin is then registered by libTwinZ.nsp.so, which "
+                              "is used instead (fill, libTwinThrows.nsp.so)"));
   EXPECT_THAT(lines, Contains("provider Twin: filled root/TwinZ (1)"));
 }
 
@@ -358,8 +358,8 @@ TEST_F(PlugInsApartMisdeedTest, OfTwoProvidersWithOneNameBothAreNamedWhenTheSeco
   Add({"TwinA", "TwinThrows"});
   TLines const lines = List("");
   EXPECT_THAT(lines, Contains("provider Twin: filled root/TwinA (1)"));
-  EXPECT_THAT(lines, Contains("provider Twin: no twin today; the name Twin is registered by libTwinA.nsp.so, which comes "
-                              "first (fill, libTwinThrows.nsp.so)"));
+  EXPECT_THAT(lines, Contains("provider Twin: no twin today; the name Twin is already registered by libTwinA.nsp.so "
+                              "(fill, libTwinThrows.nsp.so)"));
 }
 
 TEST_F(PlugInsApartMisdeedTest, AProviderThatIsRegisteredDuringTheFillIsNotFilled) {

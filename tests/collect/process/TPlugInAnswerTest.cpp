@@ -97,7 +97,7 @@ TEST_F(TPlugInAnswerTest, AnAnswerOfAnyMessagesHasAResult) {
        {{EMessage::kRegistered, "A"}, {EMessage::kTaken, "A"}, {EMessage::kDone, ""}},
        TState::kDone,
        "A: not filled, because it was registered after the plug-in had been loaded (fill); A: the plug-in registers this name "
-       "twice; the first one counts (registration)"},
+       "twice; the second registration is ignored (registration)"},
       {"the first failure of the load counts",
        {{EMessage::kStage, stage}, {EMessage::kFailed, "one"}, {EMessage::kFailed, "two"}},
        TState::kOpen,

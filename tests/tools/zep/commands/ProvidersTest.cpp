@@ -142,7 +142,7 @@ TEST_F(ProvidersTest, OfTwoPlugInsWithOneNameBothAreNamed) {
   EXPECT_EQ(run.fStatus, 2);
   EXPECT_TRUE(FailureIn(JsonOf(run), "TwinA")["error"].is_null());
   auto const second = FailureIn(JsonOf(run), "TwinB");
-  EXPECT_EQ(second["error"], "the name Twin is registered by libTwinA.nsp.so, which comes first");
+  EXPECT_EQ(second["error"], "the name Twin is already registered by libTwinA.nsp.so");
   EXPECT_EQ(second["stage"], "registration");
   EXPECT_THAT(JsonOf(run)["reason"].get<std::string>(), HasSubstr("libTwinB.nsp.so"));
 }
