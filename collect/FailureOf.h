@@ -14,7 +14,8 @@ std::string FailureOf(TWork work) {
     work();
     return "";
   } catch (std::exception const& failure) {
-    return failure.what();
+    std::string const why = failure.what();
+    return why.empty() ? "it threw an exception without a text" : why;
   } catch (...) {
     return "it threw an object that is not a std::exception";
   }

@@ -102,6 +102,7 @@ void TPlugInAnswer::TakeNamespace(std::string const& microseconds) {
 
 void TPlugInAnswer::Fail(std::string why) {
   if (!fProvider && !fResult.fError.empty()) return;
+  if (why.empty()) why = "it failed without a reason";
   bool const isOutOfMemory = fLimits.fMemoryMebibytes != 0 && why.find("std::bad_alloc") != why.npos;
   if (isOutOfMemory) why += " (the memory limit is " + std::to_string(fLimits.fMemoryMebibytes) + " MiB)";
   TProviderRun* const run = CurrentRun();

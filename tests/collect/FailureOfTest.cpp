@@ -20,6 +20,7 @@ TEST(FailureOfTest, NamesWhatWasThrown) {
 }
 
 TEST(FailureOfTest, ObjectsThatAreNotExceptionsAreCaught) {
+  EXPECT_EQ(FailureOf([] { throw std::runtime_error(""); }), "it threw an exception without a text");
   EXPECT_EQ(FailureOf([] { throw 5; }), "it threw an object that is not a std::exception");
 }
 

@@ -103,6 +103,7 @@ TEST_F(TPlugInAnswerTest, AnAnswerOfAnyMessagesHasAResult) {
        TState::kOpen,
        "one (registration)"},
       {"a stage that does not exist", {{EMessage::kStage, "\xff"}, {EMessage::kFailed, "why"}}, TState::kOpen, "why (fill)"},
+      {"a failure without a reason", {{EMessage::kFailed, ""}}, TState::kOpen, "it failed without a reason (open)"},
       {"a stage without a byte", {{EMessage::kStage, ""}, {EMessage::kFailed, "why"}}, TState::kOpen, "why (open)"},
       {"a provider that is not filled",
        {{EMessage::kRegistered, "A"}},
