@@ -76,8 +76,8 @@ void TPlugInAnswer::TakeName(TMessage const& message) {
   if (message.fKind == EMessage::kRegistered)
     AddRun(name);
   else if (HasRoomForARun())
-    fResult.fProviders.push_back(
-        {name, nullptr, 0, "the plug-in registers this name twice; the second registration is ignored", NameOf(EStage::kRegistration), ""});
+    fResult.fProviders.push_back({name, nullptr, 0, "the plug-in registers this name twice; the second registration is ignored",
+                                  NameOf(EStage::kRegistration), ""});
 }
 
 void TPlugInAnswer::TakeLoaded(std::string const& microseconds) {
