@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Compares datetime text with its peers: reading with GLib's GDateTime, printing with snprintf. Each round uses the same
-// points in time, in winter and in summer.
+// Compares datetimes with their peers: reading text and comparing with GLib's GDateTime, printing with snprintf. Each round uses
+// the same points in time, in winter and in summer.
 
 #include "TCIMDateTime.h"
 #include "TOSSpecific.h"
@@ -68,6 +68,24 @@ void Print_snprintf(benchmark::State& state) {
     }
 }
 BENCHMARK(Print_snprintf);
+
+void Compare_Zep(benchmark::State& state) {
+  std::vector<TCIMDateTime> const dateTimes = DateTimes();
+  for (auto _ : state)
+    for (TCIMDateTime const& left : dateTimes)
+      for (TCIMDateTime const& right : dateTimes) benchmark::DoNotOptimize(left < right);
+}
+BENCHMARK(Compare_Zep);
+
+void Compare_GDateTime(benchmark::State& state) {
+  std::vector<GDateTime*> dateTimes;
+  for (std::string const& text : kISOTexts) dateTimes.push_back(g_date_time_new_from_iso8601(text.c_str(), nullptr));
+  for (auto _ : state)
+    for (GDateTime* const left : dateTimes)
+      for (GDateTime* const right : dateTimes) benchmark::DoNotOptimize(g_date_time_compare(left, right));
+  for (GDateTime* const dateTime : dateTimes) g_date_time_unref(dateTime);
+}
+BENCHMARK(Compare_GDateTime);
 
 // Has no peer. The logger reads the time several times for each line.
 void LocalTime_Zep(benchmark::State& state) {

@@ -2,11 +2,11 @@
 #include "TCIMDateTimeImpl.h"
 
 #include "TZEPException.h"
-#include "core/TimeZone.h"
+#include "cim/value/StandardTime.h"
 
-#include <climits>
 #include <cstdlib>
 #include <ctime>
+#include <optional>
 #include <string_view>
 
 namespace NQRVZEP20 {
@@ -22,42 +22,66 @@ void CheckOrThrow(bool isGood) {
 
 bool IsEpochDate(unsigned short year, unsigned short month, unsigned int day) { return year == 1970 && month == 1 && day == 1; }
 
-// A calendar record in standard time. Fields may be out of range: mktime and timegm normalise them.
-std::tm RecordOf(unsigned short year, unsigned short month, unsigned int day, unsigned short hour, int minute,
-                 unsigned short second) {
+// The days from 1 March to the first of each month, less one: the table saves a third of a conversion's arithmetic.
+constexpr int kDaysFromMarch[] = {0, 305, 336, -1, 30, 60, 91, 121, 152, 183, 213, 244, 274};
+
+// The days from 1 January 1970. The month may be out of range, and the day may be any.
+std::int64_t DaysOf(int year, int month, int day) {
+  if (month < 1 || month > 12) {
+    year += (month + 11) / 12 - 1;
+    month = (month + 11) % 12 + 1;
+  }
+  // A year from March to February ends in its leap day. 400 years later, no year is negative, and all days are the same.
+  auto const sinceMarch = static_cast<unsigned int>(year + 400 - (month <= 2 ? 1 : 0));
+  unsigned int const centuries = sinceMarch / 100;
+  unsigned int const days = 1461 * sinceMarch / 4 - centuries + centuries / 4;
+  constexpr int kFrom400BeforeZeroTo1970 = 719468 + 146097;
+  return std::int64_t{day} + (static_cast<int>(days) + kDaysFromMarch[month] - kFrom400BeforeZeroTo1970);
+}
+
+[[gnu::cold]] std::int64_t TimeByMktime(int year, int month, int day, int hour, int minute, int second) {
   std::tm record{};
   record.tm_year = year - 1900;
   record.tm_mon = month - 1;
-  record.tm_mday = static_cast<int>(day);
+  record.tm_mday = day;
   record.tm_hour = hour;
   record.tm_min = minute;
   record.tm_sec = second;
-  record.tm_isdst = 0;
-  return record;
+  return std::mktime(&record);
 }
 
-// Called before localtime_r, which by itself reads TZ only once.
-void LookAtZone() {
-  static thread_local TTimeZone zone;
-  if (zone.HasChanged()) ::tzset();
+// A local time as the seconds that it would have since 1970 in UTC.
+std::int64_t LocalSeconds(int year, int month, int day, int hour, int minute, int second) {
+  return DaysOf(year, month, day) * 86400 + hour * 3600 + minute * 60 + second;
 }
 
-// Whether the zone has the local time `record` in standard time. False also when two attempts do not find its UTC offset.
-bool IsStandardTime(std::tm record) {
-  static thread_local long gmtOffset = 0;  // in seconds; initially the one that the previous call found
-  LookAtZone();
-  std::time_t const asUTC = ::timegm(&record);
-  for (int tries = 0; tries < 2; ++tries) {
-    std::time_t const time = asUTC - gmtOffset;
-    std::tm local;
-    if (::localtime_r(&time, &local) == nullptr) return false;
-    if (local.tm_gmtoff == gmtOffset) return local.tm_isdst == 0;
-    gmtOffset = local.tm_gmtoff;
-  }
-  return false;
+// What mktime returns for a local time in standard time, whose fields may be out of range. mktime itself takes up to 3000 ns;
+// TStandardTime knows nearly all of its results.
+std::int64_t TimeOf(TStandardTime const& zone, int year, int month, int day, int hour, int minute, int second) {
+  std::int64_t const local = LocalSeconds(year, month, day, hour, minute, second);
+  if (std::optional<std::int64_t> const time = zone.TimeOf(local)) return *time;
+  return TimeByMktime(year, month, day, hour, minute, second);
+}
+
+std::int64_t LocalSecondsOf(TCIMDateTimeImpl const& timestamp) {
+  auto const day = static_cast<int>(timestamp.GetDay());
+  return LocalSeconds(timestamp.GetYear(), timestamp.GetMonth(), day, timestamp.GetHour(),
+                      timestamp.GetMinute() - timestamp.GetUTCOffset(), timestamp.GetSecond());
+}
+
+// `utcOffset` is subtracted from the minutes: pass that of the timestamp to get the instant that it denotes, or 0 to read its
+// fields as local time. When mktime returns -1, a date of 1 January 1970 counts as the epoch.
+std::int64_t SecondsOf(TCIMDateTimeImpl const& timestamp, int utcOffset, TStandardTime const& zone) {
+  auto const day = static_cast<int>(timestamp.GetDay());
+  std::int64_t const time = TimeOf(zone, timestamp.GetYear(), timestamp.GetMonth(), day, timestamp.GetHour(),
+                                   timestamp.GetMinute() - utcOffset, timestamp.GetSecond());
+  if (time != -1) return time;
+  CheckOrThrow(IsEpochDate(timestamp.GetYear(), timestamp.GetMonth(), timestamp.GetDay()));
+  return 0;
 }
 
 std::tm LocalTime(std::time_t time) {
+  ::tzset();
   std::tm record;
   CheckOrThrow(::localtime_r(&time, &record) != nullptr);
   return record;
@@ -139,11 +163,8 @@ bool TCIMDateTimeImpl::IsValid(unsigned short year, unsigned short month, unsign
                                unsigned short minute, unsigned short second, unsigned int, short utcOffset) {
   if (IsEpochDate(year, month, day)) return true;
 
-  // mktime fails for a local time that the zone skipped when it changed its standard time. It is slow: it checks the zone's
-  // file and, for a time in summer, searches through years. IsStandardTime settles most times without it.
-  std::tm record = RecordOf(year, month, day, hour, minute - utcOffset, second);
-  bool const isLongAfterEpoch = year >= 1972 && day <= INT_MAX;
-  return (isLongAfterEpoch && IsStandardTime(record)) || std::mktime(&record) != -1;
+  // mktime fails for a local time that the zone skipped when it changed its standard time.
+  return TimeOf(TStandardTime::OfZone(), year, month, static_cast<int>(day), hour, minute - utcOffset, second) != -1;
 }
 
 void TCIMDateTimeImpl::Set(std::string const& text) {
@@ -225,14 +246,8 @@ std::string TCIMDateTimeImpl::ToUIString() const {
 
 // ---- Seconds ----
 
-// `utcOffset` is subtracted from the minutes: pass fUTCOffset to get the instant that the timestamp denotes, or 0 to read
-// its fields as local time. When mktime returns -1, a date of 1 January 1970 counts as the epoch.
 std::int64_t TCIMDateTimeImpl::SecondsOfTimestamp(int utcOffset) const {
-  std::tm record = RecordOf(fYear, fMonth, fDay, fHour, fMinute - utcOffset, fSecond);
-  std::time_t const time = std::mktime(&record);
-  if (time != -1) return time;
-  CheckOrThrow(IsEpochDate(fYear, fMonth, fDay));
-  return 0;
+  return SecondsOf(*this, utcOffset, TStandardTime::OfZone());
 }
 
 std::int64_t TCIMDateTimeImpl::SecondsOfInterval() const {
@@ -255,7 +270,16 @@ bool TCIMDateTimeImpl::operator==(TCIMDateTimeImpl const& other) const {
 
 bool TCIMDateTimeImpl::operator<(TCIMDateTimeImpl const& other) const {
   CheckOrThrow(!fIsNull && !other.fIsNull && fIsInterval == other.fIsInterval);
-  return OrderingKey() < other.OrderingKey();
+  if (fIsInterval) return OrderingKey() < other.OrderingKey();
+
+  // Nearly all timestamps have the order of their local times. This takes half of the time of two conversions.
+  TStandardTime const& zone = TStandardTime::OfZone();
+  std::int64_t left = LocalSecondsOf(*this), right = LocalSecondsOf(other);
+  if (!zone.HaveSameOffset(left, right)) {
+    left = SecondsOf(*this, fUTCOffset, zone);
+    right = SecondsOf(other, other.fUTCOffset, zone);
+  }
+  return left != right ? left < right : fMicroSeconds < other.fMicroSeconds;
 }
 
 // ---- Arithmetic ----
