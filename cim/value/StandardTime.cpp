@@ -5,6 +5,7 @@
 #include <fstream>
 #include <iterator>
 #include <limits>
+#include <new>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -169,16 +170,25 @@ void TStandardTime::CollectEras(std::vector<std::int64_t> const& transitions, st
   eras.End();
 }
 
+// Without memory for the file, only mktime knows, and the file is read again a second later.
 void TStandardTime::Read() {
   ::tzset();
   fCount = 0;
   fEras = {};
-  std::string const path = fZone.IsTooLong() ? "" : FileOf(fZone.Text());
-  if (path.size() >= sizeof fPath) return;
-  path.copy(fPath, path.size());
-  fPath[path.size()] = '\0';
+  fFile = {};
+  try {
+    ReadFile(fZone.IsTooLong() ? "" : FileOf(fZone.Text()));
+  } catch (std::bad_alloc const&) {
+    fCount = 0;
+    fEras = {};
+    fFile = {};
+  }
+}
+
+void TStandardTime::ReadFile(std::string const& path) {
+  fPath[path.size() < sizeof fPath ? path.copy(fPath, path.size()) : 0] = '\0';
   fFile = TFileState::Of(fPath);
-  if (path.empty()) return;
+  if (*fPath == '\0') return;
 
   // Without a file, TZ is itself a rule that applies to all years, or UTC is used.
   if (!fFile.fExists) return CollectEras({}, kStartOf1972);

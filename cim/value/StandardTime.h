@@ -11,6 +11,7 @@
 #include <cstdint>
 #include <ctime>
 #include <optional>
+#include <string>
 #include <vector>
 
 namespace NQRVZEP20 {
@@ -64,6 +65,7 @@ private:
   TStandardTime const& Checked();
   void Refresh(std::time_t now);
   void Read();
+  void ReadFile(std::string const& path);
   void CollectEras(std::vector<std::int64_t> const& transitions, std::int64_t start);
 
   TTimeZone fZone;
