@@ -190,6 +190,36 @@ TEST(GetLocalTimeTest, EachCallReadsTheZone) {
     }
 }
 
+// Asia/Kathmandu skipped this time when it changed its standard time.
+std::string ValidityInTheZone(char const* file) {
+  std::string const zones = "/usr/share/zoneinfo/";
+  if (file != nullptr) WriteFile("/etc/new", ReadFile(zones + file)), std::filesystem::rename("/etc/new", "/etc/localtime");
+  std::this_thread::sleep_for(1100ms);
+  try {
+    TCIMDateTime(std::string("19860101000500.000000+000"));
+    return "valid ";
+  } catch (TZEPException const&) {
+    return "invalid ";
+  }
+}
+
+TEST(GetLocalTimeTest, TimestampsFollowTheFileOfTheZoneWithinASecond) {
+  NEEDS(MayMount(), "permission to mount");
+  NEEDS(std::filesystem::exists("/usr/share/zoneinfo/Asia/Kathmandu"), "the zones (package tzdata)");
+  auto const validities = [] {
+    TEnvironmentGuard const zone("TZ", nullptr);
+    if (!MountTmpfs("/etc", "")) return std::string("cannot mount");
+    std::string result = ValidityInTheZone("Etc/UTC") + ValidityInTheZone("Asia/Kathmandu") + ValidityInTheZone("Etc/UTC");
+    ::setenv("TZ", "Asia/Kathmandu", 1);
+    result += ValidityInTheZone(nullptr);
+    ::unsetenv("TZ");
+    result += ValidityInTheZone("Asia/Kathmandu");
+    std::filesystem::remove("/etc/localtime");
+    return result + ValidityInTheZone(nullptr);
+  };
+  EXPECT_EQ(InChild(validities), "valid invalid valid invalid invalid valid ");
+}
+
 TEST(GetLocalTimeTest, IsExactToTheMillisecond) {
   TEnvironmentGuard const zone("TZ", "UTC0");
   for (int round = 0; round < 1000; ++round) {
