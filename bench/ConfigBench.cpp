@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Compares reading a configuration file of 100,000 lines with GLib's GKeyFile, for sorted and for shuffled keys.
+// Compares reading a configuration file of 100,000 lines with GLib's GKeyFile, for sorted and for shuffled keys, and
+// looking keys up.
 
 #include "TConfig.h"
 
@@ -71,5 +72,33 @@ void ReadByGKeyFile(benchmark::State& state, bool inOrder) {
 }
 BENCHMARK_CAPTURE(ReadByGKeyFile, InOrder, true)->Name("SettingsInOrder_GKeyFile");
 BENCHMARK_CAPTURE(ReadByGKeyFile, InAnyOrder, false)->Name("SettingsInAnyOrder_GKeyFile");
+
+// Looks up all keys, in any order.
+std::vector<std::string> Keys() {
+  std::vector<std::string> keys;
+  for (std::size_t i = 0; i < kLines; ++i) keys.push_back("collector.setting." + std::to_string(100000 + i));
+  std::shuffle(keys.begin(), keys.end(), std::mt19937(2007));
+  return keys;
+}
+
+void LookUp_Zep(benchmark::State& state) {
+  TSettingsDirectory const directory(true);
+  TConfig config;
+  std::vector<std::string> const keys = Keys();
+  for (auto _ : state)
+    for (std::string const& key : keys) benchmark::DoNotOptimize(config.getValue(key));
+}
+BENCHMARK(LookUp_Zep);
+
+void LookUp_GKeyFile(benchmark::State& state) {
+  TSettingsDirectory const directory(true);
+  GKeyFile* const file = g_key_file_new();
+  g_key_file_load_from_file(file, "zep.ini", G_KEY_FILE_NONE, nullptr);
+  std::vector<std::string> const keys = Keys();
+  for (auto _ : state)
+    for (std::string const& key : keys) g_free(g_key_file_get_value(file, "group", key.c_str(), nullptr));
+  g_key_file_free(file);
+}
+BENCHMARK(LookUp_GKeyFile);
 
 }  // namespace

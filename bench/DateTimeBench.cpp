@@ -8,8 +8,10 @@
 
 #include <benchmark/benchmark.h>
 #include <glib.h>
+#include <time.h>
 
 #include <cstdio>
+#include <ctime>
 #include <string>
 #include <vector>
 
@@ -87,7 +89,7 @@ void Compare_GDateTime(benchmark::State& state) {
 }
 BENCHMARK(Compare_GDateTime);
 
-// Has no peer. The logger reads the time several times for each line.
+// The logger reads the time several times for each line.
 void LocalTime_Zep(benchmark::State& state) {
   for (auto _ : state) {
     TCIMDateTime now = TOSSpecific::GetLocalTime();
@@ -95,5 +97,17 @@ void LocalTime_Zep(benchmark::State& state) {
   }
 }
 BENCHMARK(LocalTime_Zep);
+
+// Fields without an object that holds them.
+void LocalTime_localtime_r(benchmark::State& state) {
+  for (auto _ : state) {
+    timespec now;
+    ::clock_gettime(CLOCK_REALTIME, &now);
+    std::tm fields;
+    ::localtime_r(&now.tv_sec, &fields);
+    benchmark::DoNotOptimize(fields);
+  }
+}
+BENCHMARK(LocalTime_localtime_r);
 
 }  // namespace
