@@ -14,7 +14,8 @@
 // root may bind the port of DHCP clients (68), and only one program on the machine can have it open.
 class ZEP_EXPORT AutoProxyDiscovery {
 public:
-  static constexpr long kMessageSize = 1472;   // bytes of the message sent, and the most bytes read of a reply
+  // The size in bytes of the message sent, and the maximum number of bytes read from a reply.
+  static constexpr long kMessageSize = 1472;
   static constexpr long kOptionsOffset = 240;  // the offset of the options in a message
   static constexpr long kOptionsSize = kMessageSize - kOptionsOffset;
 

@@ -93,6 +93,8 @@ public:
   virtual void EnumerateMethodDecls(boost::function<bool(boost::shared_ptr<ICIMMethodDecl>)> callback,
                                     TCIMContext const& context) const = 0;
 
+  // ---- Instances again: declared last, because the order of the virtual functions is fixed ----
+
   // Adds an instance to the instances of this class; from then on its keys cannot be changed. Throws
   // kZEPStatusInvalidInstance for an instance that CreateInstance of this class did not make, and kZEPStatusAlreadyExists
   // when it has already been committed or another instance of the class has the same keys. Instances without keys, or with

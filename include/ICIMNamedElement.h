@@ -8,9 +8,9 @@ namespace NQRVZEP20 {
 
 class ICIMQualifier;
 
-// A schema element that has a name and may have qualifiers: a class, property, method or parameter declaration. A qualifier
-// with the boolean value false is treated as missing where a rule of these interfaces depends on it, such as Key, Abstract
-// or Association.
+// A schema element that has a name and may have qualifiers: a class, property, method or parameter declaration. Where a
+// rule of these interfaces depends on a qualifier, such as Key, Abstract or Association, a qualifier with the value false is
+// treated as missing.
 class ZEP_EXPORT ICIMNamedElement : public ICIMElement {
 public:
   ~ICIMNamedElement() override;

@@ -15,7 +15,8 @@ class ZEP_EXPORT ICIMNamespace {
 public:
   virtual ~ICIMNamespace();
 
-  virtual std::string GetName(TCIMContext const& context) const;  // such as "root/cimv2"; has a default body
+  // Such as "root/cimv2". Has a default body, which logs an error and throws kZEPStatusNotImplemented.
+  virtual std::string GetName(TCIMContext const& context) const;
 
   // Creates a class derived from `superClass`, or a root class when `superClass` is empty. Throws kZEPStatusInvalidClass when
   // `superClass` belongs to another namespace, and kZEPStatusAlreadyExists when a class of that name exists.

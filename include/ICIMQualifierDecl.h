@@ -25,7 +25,7 @@ public:
   enum EFlavor : unsigned int {
     kFlavorEnableOverride = 0x01,  // a subclass may give the qualifier another value
     kFlavorToSubclass = 0x02,      // subclasses inherit it; without this flag it applies to its own element only
-    kFlavorTranslatable = 0x04,
+    kFlavorTranslatable = 0x04,    // the value may be translated into other languages
     kFlavorDefault = kFlavorEnableOverride | kFlavorToSubclass
   };
 

@@ -87,7 +87,7 @@ public:
   // Copies `count` bytes of the session identifier when `count` is 1 to 19, otherwise nothing.
   void getIPMISessionID(char* output, int count);
 
-  // Copy 20 bytes (getBMCPassword) and 40 bytes (getIPMIAddress), whatever `size` is. Kept.
+  // Copy 20 bytes (getBMCPassword) and 40 bytes (getIPMIAddress), regardless of `size`. Kept.
   void getBMCPassword(char* output, int size);
   void getIPMIAddress(char* output, int size);
 
@@ -100,11 +100,11 @@ public:
   char GenSum(char* buffer, int first, int last);
 
   // Validates a response packet. The packet consists of the RMCP header, the session header, which starts at byte 4, an
-  // authentication code of 16 bytes unless byte 4 is 0, the message length and the message. `lengthPosition` is the offset of
-  // the length byte in a packet with an authentication code, also for a packet without one. `mode` 0 tests the checksum and
-  // the completion code, 1 the checksum, 2 the completion code, any other value nothing. Success makes getipmiLanStatus true;
-  // failure does not change it. A test that would need a byte before the start of the packet fails. After the length byte,
-  // the buffer must contain at least as many bytes as the message length, and never less than 7.
+  // authentication code of 16 bytes unless byte 4 is 0, the message length and the message. `lengthPosition` is the offset that
+  // the length byte has in a packet with an authentication code; pass the same for a packet without one. `mode` 0 tests the
+  // checksum and the completion code, 1 the checksum, 2 the completion code, any other value nothing. Success makes
+  // getipmiLanStatus true; failure does not change it. A test that would need a byte before the start of the packet fails.
+  // After the length byte, the buffer must contain at least as many bytes as the message length, and never less than 7.
   bool ChkResponse(char* packet, int lengthPosition, int mode);
 
   static IIPMILan* fgipmilanInstance;             // null before Initialize

@@ -50,9 +50,9 @@ public:
   // of the destination class. Holds copyInstMutex during the call, so only one thread at a time copies an instance.
   static void CopyInstance(boost::shared_ptr<ICIMInstance> inst, boost::shared_ptr<ICIMNamespace> dst);
 
-  // Returns the value for use in `dst`. A reference, also a NULL one or one in an array, then refers to the class of the same
-  // name in `dst`; its keys are copied. Throws kZEPStatusNotFound when `dst` has no such class. Any other value is returned
-  // unchanged.
+  // Returns the value for use in `dst`. Each reference, including NULL references and those in an array, then refers to the
+  // class of the same name in `dst`; its keys are copied. Throws kZEPStatusNotFound when `dst` has no such class. Any other
+  // value is returned unchanged.
   static TCIMValue CopyValue(TCIMValue const& v, boost::shared_ptr<ICIMNamespace> dst);
 };
 
@@ -166,7 +166,8 @@ private:
   boost::shared_ptr<NQRVZEP20::ICIMInstance> fTarget;
 };
 
-// Copies a key binding of a reference into `target`, whose class must be set and which must outlive the callback.
+// Copies a key binding of a reference into `target`. The class of `target` must be set, and `target` must outlive the
+// callback.
 class ZEP_EXPORT TCopyReferenceKeys {
 public:
   TCopyReferenceKeys(boost::weak_ptr<NQRVZEP20::ICIMNamespace> destination, NQRVZEP20::TCIMReference& target);

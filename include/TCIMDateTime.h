@@ -70,9 +70,10 @@ public:
   // interval, with the trailing blank. The text of a zero interval is empty.
   std::string ToUIString() const;
 
-  // ---- Comparison. Timestamps are compared by the instant that they represent, then by microseconds; intervals by their
-  // length.
-  //      Throws kZEPStatusInvalidDateTime when either is NULL, or when one is a timestamp and the other an interval. ----
+  // ---- Comparison ----
+
+  // Timestamps are compared by the instant that they represent, then by microseconds; intervals by their length. All throw
+  // kZEPStatusInvalidDateTime when either is NULL, or when one is a timestamp and the other an interval.
 
   bool operator==(TCIMDateTime const& other) const;
   bool operator<(TCIMDateTime const& other) const;

@@ -46,8 +46,8 @@ public:
 
   // ---- Machine type and model (MTM): a type of 4 characters and a model of 3, "xxx" when the model is unknown ----
 
-  // The product name, unchanged. Throws kZEPStatusNotFound for every failure, also for a value that is NULL or not a string,
-  // and logs the reason at debug severity.
+  // The product name, unchanged. Throws kZEPStatusNotFound for every failure, including a value that is NULL or not a
+  // string, and logs the reason at debug severity.
   static std::string GetRawMTMString(boost::shared_ptr<ICIMNamespace> ns);
 
   // The machine type and model in the product name, which has the form "Server X1-[1234ABC]-", "Server X1-[1234]-", "1234ABC"

@@ -62,8 +62,8 @@ public:
 
   // ---- Writing ----
 
-  // First drops an entry whose severity is above the threshold, unless the severity is kLogMemoryOnly or
-  // kLogMemoryOnlyAlways. Then adds the entry to the list if its severity is at most kLogStatus (also a negative one) or
+  // First drops an entry whose severity is above the threshold, unless the severity is kLogMemoryOnly or kLogMemoryOnlyAlways.
+  // Then adds the entry to the list if its severity is at most kLogStatus, which includes negative ones, or if it is
   // memory-only. Then writes the entry, unless it is memory-only, to this thread's file, if there is one, in this form:
   //   FDR_[Status] 3/3/2024  9:5:7 message
   // A zero byte in the message ends the written line there, without a newline; the list holds the complete message. Kept.

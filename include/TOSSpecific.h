@@ -46,9 +46,9 @@ struct TRemovableMedium {
   std::string fMountPoint;   // "/mnt/key"; empty when mounting failed
 };
 
-// All operating system services that the library uses. All functions are static. Each runs on the caller's thread and blocks
-// it until done; none takes a lock, except to log. Failures are thrown as TZEPException unless the comment of a function
-// states otherwise.
+// All operating system services that the library uses. All functions are static. Each runs on the caller's thread and blocks it
+// until done; none takes a lock, except to log and to load libsmbios.so or libipmiClient.so. Failures are thrown as
+// TZEPException unless the comment of a function states otherwise.
 class ZEP_EXPORT TOSSpecific {
 public:
   // ---- Files and directories (TOSSpecificFiles.cpp) ----
@@ -96,7 +96,7 @@ public:
   static void FileCopy(std::string from, std::string to);
 
   // Copies the files of a directory, following symbolic links, and with `recursive` also its subdirectories. `to` is created
-  // when it is missing, but its parents are not. An entry that cannot be stat'ed, such as a dangling symbolic link, is
+  // when it is missing, but its parents are not. An entry for which stat fails, such as a dangling symbolic link, is
   // skipped. Kept. Returns the result of closing the source directory, 0. Throws kZEPStatusFileSystemError when a directory
   // cannot be opened; exceptions of CreateDir and FileCopy pass through. The files already copied remain.
   static int DirCopy(std::string from, std::string to, bool recursive);
@@ -261,8 +261,8 @@ public:
 
   // The base names of the libraries of that kind in the root path, in directory order. A library is any entry that is not a
   // directory and whose name contains ".<kind>". Its base name is the name without its first three and last seven characters,
-  // whatever these are; a shorter name gives an empty base name. Kept. Throws kZEPStatusFileSystemError when the root path
-  // cannot be opened.
+  // regardless of what they are; a name of at most ten characters gives an empty base name. Kept. Throws
+  // kZEPStatusFileSystemError when the root path cannot be opened.
   static std::vector<std::string> FindNSServices(std::string kind);
   static std::vector<std::string> FindNSPs();  // of the kind "nsp"
   static std::vector<std::string> FindNSCs();  // of the kind "nsc"
