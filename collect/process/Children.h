@@ -7,8 +7,7 @@
 
 namespace NQRVZEP20 {
 
-// The children of this process, those included that have ended and that nobody has waited for. Empty on a kernel that was built
-// without the list (CONFIG_PROC_CHILDREN).
+// The children of this process, including zombies. Empty on a kernel that was built without CONFIG_PROC_CHILDREN.
 std::vector<pid_t> Children();
 
 // Becomes the parent of processes whose parent has ended, as init usually does, and ends them. The constructor and the destructor

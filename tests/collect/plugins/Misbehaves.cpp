@@ -86,7 +86,7 @@ void FillMemory() {
 
 // ---- The supervisor and the pipe of the answer ----
 
-// Leaves a process behind, and hangs without a supervisor.
+// Starts a daemon, then sends the signal to the supervisor.
 void HarmSupervisor(int signal) {
   StartDaemon(OwnName());
   ::kill(::getppid(), signal);

@@ -47,8 +47,8 @@ private:
   std::string fNumber;
 };
 
-// A TCP port of loopback that neither accepts nor refuses a connection, as behind a firewall that drops packets: its queue, which
-// holds one connection, is full.
+// A TCP port on the loopback interface that neither accepts nor refuses a connection, like one behind a firewall that drops
+// packets: its queue, which has room for one connection, is full.
 class TSilentPort {
 public:
   TSilentPort()
