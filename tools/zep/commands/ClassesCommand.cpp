@@ -82,7 +82,7 @@ struct TClasses {
   std::vector<TNamespaceClasses> fNamespaces;
   std::vector<std::string> fFailures;  // of the providers
   TJson fFailedPlugIns;
-  std::string fSampleLabel;            // empty without a sample
+  std::string fSampleLabel;  // empty without a sample
 
   bool IsEmpty() const {
     return std::all_of(fNamespaces.begin(), fNamespaces.end(), [](TNamespaceClasses const& ns) { return ns.fClasses.empty(); });
