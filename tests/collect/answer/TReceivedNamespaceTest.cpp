@@ -331,6 +331,7 @@ TEST(TReceivedNamespaceTest, ThePropertiesOfAWideInstanceAreReadSoon) {
 }
 
 TEST(TReceivedNamespaceTest, ReferencesToAClassOutsideWithManyKeysAreReadSoon) {
+  int const number = kIsSanitized ? 500 : 2000;
   TByteWriter writer;
   writer.Number(0);
   WriteClass(writer, "X_Item", 0);
@@ -338,11 +339,11 @@ TEST(TReceivedNamespaceTest, ReferencesToAClassOutsideWithManyKeysAreReadSoon) {
   writer.Number(kLayout);
   writer.Number(0);
   writer.Byte(0);
-  writer.Number(2000);
-  for (int n = 0; n < 2000; ++n) writer.Text("P" + std::to_string(n)), writer.Number(0);
+  writer.Number(static_cast<std::uint64_t>(number));
+  for (int n = 0; n < number; ++n) writer.Text("P" + std::to_string(n)), writer.Number(0);
   writer.Number(kInstance);
   writer.Number(0);
-  for (int n = 0; n < 2000; ++n) {
+  for (int n = 0; n < number; ++n) {
     writer.Byte(TCIMValue::TCIMType::kCIMTypeReference);
     writer.Byte(0);    // it has no namespace
     writer.Number(1);  // its class is outside
@@ -365,7 +366,7 @@ TEST(TReceivedNamespaceTest, ReferencesToAClassOutsideWithManyKeysAreReadSoon) {
           return true;
         },
         kNone);
-    EXPECT_EQ(references, 2000);
+    EXPECT_EQ(references, number);
   });
 }
 
