@@ -24,7 +24,7 @@ struct stat StatusOf(std::string const& file) {
 
 class PartFileTest : public testing::Test {
 protected:
-  // A file that the user nobody may replace.
+  // A file that an unprivileged user ("nobody") is allowed to replace.
   void MakeFile(gid_t group, mode_t mode) {
     WriteFile(fFile, "old");
     ASSERT_EQ(::chown(fFile.c_str(), kNobody, group), 0);
