@@ -25,7 +25,7 @@ TSystemName SystemNameOf(utsname const& kernel) {
 }
 
 TRecord OperatingSystemRecord(TOsRelease const& release, utsname const& kernel, TSystemName const& name) {
-  TRecord record(TCIMSchemaHelper::kOperatingSystemCreationClassName, release.GetFile());
+  TRecord record(TCIMSchemaHelper::kOperatingSystemCreationClassName, release.GetFile(), "CIM_OperatingSystem");
   record.AddKey("CSCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
   record.AddPropagatedKey("CSName", name.fName);
   record.AddKey("CreationClassName", TCIMSchemaHelper::kOperatingSystemCreationClassName);

@@ -85,7 +85,7 @@ TText DeviceTypeFrom(std::string const& number) {
 
 TRecord MakeRecord(TSystemName const& name, TText const& id, TText const& type, TText const& vendor, TText const& product,
                    TText const& revision) {
-  TRecord record(kClassName, "sysfs");
+  TRecord record(kClassName, "sysfs", "CIM_LogicalDevice");
   record.AddKey("SystemCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
   record.AddPropagatedKey("SystemName", name.fName);
   record.AddKey("CreationClassName", kClassName);

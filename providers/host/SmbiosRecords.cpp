@@ -5,6 +5,7 @@
 #include "TCIMDateTime.h"
 #include "TCIMSchemaHelper.h"
 #include "TZEPException.h"
+#include "ValueNames.h"
 
 #include <algorithm>
 #include <cstdio>
@@ -290,7 +291,7 @@ TFinding<std::uint32_t> SpeedOf(TSmbiosStructure const& memoryDevice, std::size_
 
 TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name,
                              TFinding<std::optional<TSmbiosVersion>> const& version) {
-  TRecord record(TCIMSchemaHelper::kSystemCreationClassName, name.fSource);
+  TRecord record(TCIMSchemaHelper::kSystemCreationClassName, name.fSource, "CIM_ComputerSystem");
   record.AddKey("CreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
   record.AddKey("Name", name.fName);
   record.SetSource(source);
@@ -309,9 +310,9 @@ TRecord BiosRecord(TSmbiosStructure const& bios, std::string const& source, unsi
   TRecord record("CIM_BIOSElement", source);
   record.AddKey("Name", "BIOS " + std::to_string(number));
   record.AddKey("Version", TextOf(bios, 0x05));
-  record.AddKey("SoftwareElementState", running);
+  record.AddKey("SoftwareElementState", running).Names(kSoftwareElementStateNames);
   record.AddKey("SoftwareElementID", "BIOS " + std::to_string(number));
-  record.AddKey("TargetOperatingSystem", unknownSystem);
+  record.AddKey("TargetOperatingSystem", unknownSystem).Names(kTargetOperatingSystemNames);
   record.Add("Manufacturer", TextOf(bios, 0x04));
   record.Add("ReleaseDate", TextOf(bios, 0x08).Then(DateFrom));
   record.Add("LoadedStartingAddress", StartAddressOf(bios));
@@ -328,10 +329,10 @@ TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source
   record.Add("SerialNumber", TextOf(chassis, 0x07));
   record.Add("UserTracking", TextOf(chassis, 0x08));
   record.Add("SKU", ChassisSkuOf(chassis));
-  record.Add("ChassisPackageType", ChassisTypeOf(chassis).Then(PackageTypeFrom));
+  record.Add("ChassisPackageType", ChassisTypeOf(chassis).Then(PackageTypeFrom)).Names(kChassisPackageTypeNames);
   record.Add("ChassisTypeDescription", ChassisTypeOf(chassis).Then(ChassisTypeName));
   record.Add("LockPresent", LockOf(chassis));
-  record.Add("Height", HeightOf(chassis));
+  record.Add("Height", HeightOf(chassis)).Unit("inch");
   record.Add("NumberOfPowerCords", NumberOf<std::uint16_t>(chassis.Byte(0x12), std::uint8_t(0)));
   return record;
 }
@@ -346,13 +347,13 @@ TRecord ProcessorRecord(TSmbiosStructure const& processor, std::string const& so
   record.Add("ElementName", TextOf(processor, 0x10));
   record.Add("Role", RoleOf(processor));
   record.Add("Family", FamilyOf(processor));
-  record.Add("UpgradeMethod", UpgradeMethodOf(processor));
-  record.Add("MaxClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x14), std::uint16_t(0)));
-  record.Add("CurrentClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x16), std::uint16_t(0)));
-  record.Add("ExternalBusClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x12), std::uint16_t(0)));
-  record.Add("DataWidth", processor.Word(0x26).Then(DataWidthFrom));
+  record.Add("UpgradeMethod", UpgradeMethodOf(processor)).Names(kUpgradeMethodNames);
+  record.Add("MaxClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x14), std::uint16_t(0))).Unit("hertz * 10^6");
+  record.Add("CurrentClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x16), std::uint16_t(0))).Unit("hertz * 10^6");
+  record.Add("ExternalBusClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x12), std::uint16_t(0))).Unit("hertz * 10^6");
+  record.Add("DataWidth", processor.Word(0x26).Then(DataWidthFrom)).Unit("bit");
   record.Add("UniqueID", processor.Bytes(0x08, 8).Then(ProcessorIdFrom));
-  record.Add("CPUStatus", processor.Byte(0x18).Then(CpuStatusFrom));
+  record.Add("CPUStatus", processor.Byte(0x18).Then(CpuStatusFrom)).Names(kCPUStatusNames);
   record.Add("NumberOfEnabledCores", EnabledCoresOf(processor));
   return record;
 }
@@ -367,17 +368,17 @@ TRecord MemoryRecord(TSmbiosStructure const& memoryDevice, std::string const& so
   record.Add("SerialNumber", TextOf(memoryDevice, 0x18));
   record.Add("UserTracking", TextOf(memoryDevice, 0x19));
   record.Add("PartNumber", TextOf(memoryDevice, 0x1a));
-  record.Add("Capacity", CapacityOf(memoryDevice));
-  record.Add("FormFactor", CimNumberOf(memoryDevice.Byte(0x0e), kFormFactors));
-  record.Add("MemoryType", CimNumberOf(memoryDevice.Byte(0x12), kMemoryTypes));
-  record.Add("TotalWidth", NumberOf<std::uint16_t>(memoryDevice.Word(0x08), std::uint16_t(0xffff)));
-  record.Add("DataWidth", NumberOf<std::uint16_t>(memoryDevice.Word(0x0a), std::uint16_t(0xffff)));
+  record.Add("Capacity", CapacityOf(memoryDevice)).Unit("byte");
+  record.Add("FormFactor", CimNumberOf(memoryDevice.Byte(0x0e), kFormFactors)).Names(kFormFactorNames);
+  record.Add("MemoryType", CimNumberOf(memoryDevice.Byte(0x12), kMemoryTypes)).Names(kMemoryTypeNames);
+  record.Add("TotalWidth", NumberOf<std::uint16_t>(memoryDevice.Word(0x08), std::uint16_t(0xffff))).Unit("bit");
+  record.Add("DataWidth", NumberOf<std::uint16_t>(memoryDevice.Word(0x0a), std::uint16_t(0xffff))).Unit("bit");
 
   // SMBIOS states the speed in megahertz, not the time in nanoseconds.
   auto const speed = SpeedOf(memoryDevice, 0x15, 0x54);
   record.Add("IsSpeedInMhz", TFinding<bool>(static_cast<bool>(speed)));
-  record.Add("MaxMemorySpeed", speed);
-  record.Add("ConfiguredMemoryClockSpeed", SpeedOf(memoryDevice, 0x20, 0x58));
+  record.Add("MaxMemorySpeed", speed).Unit("hertz * 10^6");
+  record.Add("ConfiguredMemoryClockSpeed", SpeedOf(memoryDevice, 0x20, 0x58)).Unit("hertz * 10^6");
   return record;
 }
 

@@ -113,5 +113,116 @@ TEST_F(TRecordWriterTest, AClassIsNotWrittenTwice) {
   }
 }
 
+// ---- Classes of the schema ----
+
+class TSchemaRecordTest : public TRecordWriterTest {
+protected:
+  static TRecord Device(char const* className, std::string const& id) {
+    TRecord record(className, "sysfs");
+    record.AddKey("SystemName", "host");
+    record.AddKey("DeviceID", id);
+    record.Add("Capacity", TFinding<unsigned long>(5)).Unit("byte");
+    return record;
+  }
+  static TRecord System() {
+    TRecord record("CIM_ComputerSystem", "uname");
+    record.AddKey("CreationClassName", "CIM_ComputerSystem");
+    record.AddKey("Name", "host");
+    return record;
+  }
+
+  // The class and its superclasses; the abstract ones in parentheses.
+  std::vector<std::string> ChainOf(char const* className) const {
+    std::vector<std::string> chain;
+    for (auto cls = fNs->GetClass(className, kNone); cls; cls = cls->GetSuperClass(kNone)) {
+      std::string const name = cls->GetName(kNone);
+      chain.push_back(cls->IsAbstract(kNone) ? "(" + name + ")" : name);
+    }
+    return chain;
+  }
+
+  std::string QualifierOf(char const* className, char const* property, char const* qualifier) const {
+    auto const found = fNs->GetClass(className, kNone)->GetPropertyDecl(property, kNone)->GetQualifier(qualifier, kNone);
+    return found ? found->GetValue(kNone).ToString() : "none";
+  }
+};
+
+TEST_F(TSchemaRecordTest, AClassIsBelowItsSuperclassesOfTheSchema) {
+  fWriter.Write(Device("CIM_DiskDrive", "sda"));
+  EXPECT_THAT(
+      ChainOf("CIM_DiskDrive"),
+      ElementsAre("CIM_DiskDrive", "CIM_MediaAccessDevice", "(CIM_LogicalDevice)", "(CIM_AllocatedLogicalElement)",
+                  "(CIM_EnabledLogicalElement)", "(CIM_LogicalElement)", "(CIM_ManagedSystemElement)", "(CIM_ManagedElement)"));
+}
+
+TEST_F(TSchemaRecordTest, AnotherClassIsBelowTheSuperclassOfItsRecord) {
+  TRecord record("X_Disk", "sysfs", "CIM_MediaAccessDevice");
+  record.AddKey("DeviceID", "sda");
+  fWriter.Write(record);
+  EXPECT_THAT(ChainOf("X_Disk"), testing::Contains("(CIM_LogicalDevice)"));
+}
+
+TEST_F(TSchemaRecordTest, ASuperclassMayHaveRecordsOfItsOwn) {
+  fWriter.Write(Device("CIM_PCIDevice", "00:01.0"));
+  fWriter.Write(Device("CIM_PCIBridge", "00:02.0"));
+  EXPECT_THAT(InstancesOf("CIM_PCIDevice"),
+              ElementsAre(testing::StartsWith("CIM_PCIDevice"), testing::StartsWith("CIM_PCIBridge")));
+  EXPECT_EQ(fNs->GetClass("CIM_PCIBridge", kNone)->GetPropertyDecl("DeviceID", kNone)->GetName(kNone), "DeviceID");
+}
+
+TEST_F(TSchemaRecordTest, RecordsMayFollowForAClassThatWasASuperclass) {
+  fWriter.Write(Device("CIM_PCIBridge", "00:02.0"), {}, kNoDisks);
+  fWriter.Write(Device("CIM_PCIDevice", "00:01.0"));
+  EXPECT_THAT(InstancesOf("CIM_PCIDevice"), ElementsAre(testing::StartsWith("CIM_PCIDevice")));
+}
+
+TEST_F(TSchemaRecordTest, AUnitIsAQualifier) {
+  fWriter.Write(Device("CIM_DiskDrive", "sda"));
+  EXPECT_EQ(QualifierOf("CIM_DiskDrive", "Capacity", "PUnit"), "byte");
+  EXPECT_EQ(QualifierOf("CIM_DiskDrive", "DeviceID", "PUnit"), "none");
+}
+
+TEST_F(TSchemaRecordTest, NamesOfValuesAreQualifiers) {
+  static constexpr TValueName kStates[] = {{"2", "Enabled"}, {"3", "Disabled"}};
+  TRecord record = Device("CIM_DiskDrive", "sda");
+  record.Add("EnabledState", TFinding<unsigned short>(kUnreadable)).Names(kStates);
+  fWriter.Write(record);
+  EXPECT_EQ(QualifierOf("CIM_DiskDrive", "EnabledState", "ValueMap"), "{ 2, 3 }");
+  EXPECT_EQ(QualifierOf("CIM_DiskDrive", "EnabledState", "Values"), "{ Enabled, Disabled }");
+}
+
+TEST_F(TSchemaRecordTest, AVectorIsAnArray) {
+  TRecord record = Device("CIM_DiskDrive", "sda");
+  record.Add("OperationalStatus", TFinding<std::vector<unsigned short>>(std::vector<unsigned short>{2, 5}));
+  record.Add("Capabilities", TFinding<std::vector<unsigned short>>(kUnreadable));
+  fWriter.Write(record);
+  EXPECT_THAT(InstancesOf("CIM_DiskDrive"), ElementsAre(testing::EndsWith("<{ 2, 5 }> <NULL>")));
+}
+
+TEST_F(TSchemaRecordTest, InstancesAreAssociated) {
+  TRecord const system = System(), disk = Device("CIM_DiskDrive", "sda"), fan = Device("CIM_Fan", "fan");
+  fWriter.Write(system);
+  fWriter.Write(disk);
+  fWriter.Write(fan);
+  fWriter.Associate(kSystemDevice, system, disk);
+  fWriter.Associate(kSystemDevice, system, fan);
+  EXPECT_THAT(ChainOf("CIM_SystemDevice"), ElementsAre("CIM_SystemDevice", "CIM_SystemComponent", "(CIM_Component)"));
+  EXPECT_TRUE(fNs->GetClass("CIM_SystemDevice", kNone)->GetPropertyDecl("PartComponent", kNone)->IsKey(kNone));
+  EXPECT_THAT(InstancesOf("CIM_SystemDevice"),
+              ElementsAre(testing::AllOf(testing::HasSubstr("Name=\"host\""), testing::HasSubstr("DeviceID=\"sda\"")),
+                          testing::HasSubstr("DeviceID=\"fan\"")));
+}
+
+TEST_F(TSchemaRecordTest, OnlyWrittenRecordsAreAssociated) {
+  fWriter.Write(System());
+  fWriter.Write(Device("CIM_DiskDrive", "sda"));
+  try {
+    fWriter.Associate(kSystemDevice, System(), Device("CIM_DiskDrive", "sdb"));
+    FAIL() << "nothing was thrown";
+  } catch (TZEPException const& failure) {
+    EXPECT_EQ(failure.GetStatusCode(), kZEPStatusNotFound);
+  }
+}
+
 }  // namespace
 }  // namespace NQRVZEP20

@@ -99,7 +99,7 @@ TEST_F(ShowTest, AnObjectIsShownWithTypesAndValues) {
             "SerialNumber              string      KQ12345\n"
             "UserTracking              string      RACK-07-U21\n"
             "SKU                       string      1234AB7\n"
-            "ChassisPackageType        uint16      23\n"
+            "ChassisPackageType        uint16      23 (SMBIOS Reserved)\n"
             "ChassisTypeDescription    string      Rack Mount Chassis\n"
             "LockPresent               boolean     false\n"
             "Height                    real32      3.5\n"
@@ -235,7 +235,7 @@ TEST_F(ShowTest, AMissingObjectHasADocument) {
 
 TEST_F(ShowTest, TheSampleIsLabelled) {
   TRun const run = Run({"show", "--sample", "CIM_Chassis"});
-  EXPECT_THAT(run.fOutput, testing::StartsWith("SAMPLE root/zep/host:CIM_Chassis\n"));
+  EXPECT_THAT(run.fOutput, testing::StartsWith("SAMPLE root/zep/host:CIM_Chassis : CIM_PhysicalFrame : "));
   auto const document = JsonOf(Run({"show", "--sample", "--json", "CIM_Chassis"}));
   EXPECT_EQ(document["sample"], true);
   EXPECT_EQ(document["label"], "SAMPLE");

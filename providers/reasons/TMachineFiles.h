@@ -1,0 +1,84 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "TFinding.h"
+
+#include <charconv>
+#include <cstddef>
+#include <functional>
+#include <string>
+#include <type_traits>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+// The files that describe a machine, such as those below /sys and /proc. They are read below a root directory: "/" for the
+// machine itself, or a directory with the recorded files of another machine.
+//
+// Paths are absolute, as on the described machine: "/sys/class/net". Symbolic links are followed within the root, so that a
+// recording cannot lead to a file outside it. Only regular files are read: a device or a FIFO is reported as unreadable. Every
+// operation asks the file system anew and blocks as long as it does. A plain value; several threads may use the same object.
+class TMachineFiles {
+public:
+  // The root that the environment variable ZEP_ROOT names, or "/".
+  static TMachineFiles OfThisProcess();
+
+  // `root`: a directory, with or without a slash at the end.
+  explicit TMachineFiles(std::string root);
+
+  bool IsThisMachine() const { return fRoot.empty(); }
+
+  // The path in the file system of this process. A library that opens it follows links without regard to the root.
+  std::string Outside(std::string const& path) const { return fRoot + path; }
+
+  // The content. Missing if the file does not exist, cannot be opened or read, is not a regular file, or is longer than
+  // `limit` bytes.
+  TFinding<std::string> Content(std::string const& path, std::size_t limit = std::size_t(1) << 20) const;
+
+  // The first line, without blanks at either end. Missing like Content, and if the line is empty.
+  TFinding<std::string> Line(std::string const& path) const;
+
+  // The number in the first line: decimal digits after an optional minus sign, or hexadecimal digits after "0x". Missing like
+  // Line, and if the line is not a number of type T.
+  template <class T>
+  TFinding<T> Number(std::string const& path) const {
+    return Line(path).Then([&](std::string const& text) { return NumberFrom<T>(text, path); });
+  }
+
+  // The names in a directory, without "." and "..", with numbers in numeric order: eth2 before eth10. None if the directory
+  // does not exist or cannot be read.
+  std::vector<std::string> Names(std::string const& directory) const;
+
+  // Whether the path exists, as a file of any kind.
+  bool Exists(std::string const& path) const;
+
+  // The path without symbolic links and without the root. Missing if the path does not exist.
+  TFinding<std::string> RealPath(std::string const& path) const;
+
+  // The last name of the real path: "e1000e" for the link /sys/class/net/eth0/device/driver. Missing like RealPath.
+  TFinding<std::string> RealName(std::string const& path) const;
+
+  // The answer to a query that is not made by reading a file, such as a system call or the output of a program. On this machine
+  // it is the result of `ask`; otherwise the content of the recorded file /zep-answers/`name`, of at most 16 MiB.
+  TFinding<std::string> Answer(std::string const& name, std::function<TFinding<std::string>()> const& ask) const;
+
+private:
+  template <class T>
+  static TFinding<T> NumberFrom(std::string const& text, std::string const& path) {
+    bool const isHex = text.compare(0, 2, "0x") == 0;
+    char const* const end = text.data() + text.size();
+    T number{};
+    auto const [stop, error] = [&] {
+      if constexpr (std::is_integral_v<T>)
+        return std::from_chars(text.data() + (isHex ? 2 : 0), end, number, isHex ? 16 : 10);
+      else
+        return std::from_chars(text.data(), end, number);
+    }();
+    if (error == std::errc() && stop == end) return number;
+    return TMissing{kMissingUnexpected, path + " contains \"" + text + "\", which is not a number in the expected range"};
+  }
+
+  std::string fRoot;  // without a slash at the end; empty for "/"
+};
+
+}  // namespace NQRVZEP20
