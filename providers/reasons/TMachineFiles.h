@@ -59,7 +59,8 @@ public:
   TFinding<std::string> RealName(std::string const& path) const;
 
   // The answer to a query that is not made by reading a file, such as a system call or the output of a program. On this machine
-  // it is the result of `ask`; otherwise the content of the recorded file /zep-answers/`name`, of at most 16 MiB.
+  // it is the result of `ask`, which is also recorded below the directory that ZEP_RECORD_ANSWERS names, if set;
+  // otherwise it is the content of the recorded file /zep-answers/`name`, of at most 16 MiB. A missing answer is not recorded.
   TFinding<std::string> Answer(std::string const& name, std::function<TFinding<std::string>()> const& ask) const;
 
 private:

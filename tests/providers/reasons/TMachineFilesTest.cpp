@@ -157,6 +157,14 @@ TEST_F(TMachineFilesTest, AnAnswerIsRecordedBelowAnotherRoot) {
   EXPECT_EQ(Shown(TMachineFiles("/").Answer("netlink/links", ask)), "of this machine");
 }
 
+TEST_F(TMachineFilesTest, AnAnswerOfThisMachineIsRecorded) {
+  TEnvironmentGuard const recording("ZEP_RECORD_ANSWERS", fRoot.c_str());
+  TMachineFiles("/").Answer("ethtool/eth0/driver", [] { return TFinding<std::string>(std::string("a\0b\n", 4)); });
+  TMachineFiles("/").Answer("netlink/links", [] { return TFinding<std::string>(TMissing{kMissingUnreadable, "refused"}); });
+  EXPECT_EQ(ReadFile(fRoot + "/zep-answers/ethtool/eth0/driver"), std::string("a\0b\n", 4));
+  EXPECT_FALSE(fs::exists(fRoot + "/zep-answers/netlink"));
+}
+
 TEST_F(TMachineFilesTest, ThisMachineHasRealPaths) {
   TMachineFiles const files("/");
   WriteFile(fDir.Path("file"), "x");
