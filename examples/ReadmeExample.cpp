@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Asks the host provider for the machine type and model of this machine.
+// Prints the machine type and model of this machine, as the host provider describes it.
 
 #include <zepcore.h>
 
