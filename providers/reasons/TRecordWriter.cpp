@@ -93,8 +93,8 @@ void TRecordWriter::EnsureClass(std::string const& name) {
   if (!HasClass(name)) fWithoutRecords.emplace(name, DefineClass(name, ""));
 }
 
-void TRecordWriter::AddInstance(TRecord const& record) {
-  TMemoryValues values;
+// `values`: further values of the instance.
+void TRecordWriter::AddInstance(TRecord const& record, TMemoryValues values) {
   for (TRecordProperty const& property : record.GetProperties())
     if (!property.fValue.IsNull()) values.emplace_back(property.fName, property.fValue);
   std::string const path = fNamespace.AddInstance(record.GetClassName(), values)->GetPath(TCIMContext()).GetPath();
@@ -104,17 +104,23 @@ void TRecordWriter::AddInstance(TRecord const& record) {
 }
 
 void TRecordWriter::Associate(TAssociation const& association, TRecord const& first, TRecord const& second) {
-  if (!HasClass(association.fClassName) || fWithoutRecords.count(association.fClassName) > 0) DeclareAssociation(association);
-  fNamespace.AddInstance(association.fClassName,
-                         {{association.fFirstName, ReferenceTo(first)}, {association.fSecondName, ReferenceTo(second)}});
+  Associate(association, first, second, TRecord(association.fClassName, ""));
 }
 
-void TRecordWriter::DeclareAssociation(TAssociation const& association) {
+void TRecordWriter::Associate(TAssociation const& association, TRecord const& first, TRecord const& second,
+                              TRecord const& more) {
+  if (!HasClass(association.fClassName) || fWithoutRecords.count(association.fClassName) > 0)
+    DeclareAssociation(association, more);
+  AddInstance(more, {{association.fFirstName, ReferenceTo(first)}, {association.fSecondName, ReferenceTo(second)}});
+}
+
+void TRecordWriter::DeclareAssociation(TAssociation const& association, TRecord const& more) {
   EnsureClass(association.fFirstClass);
   EnsureClass(association.fSecondClass);
-  DefineClass(association.fClassName, "")
-      .KeyReference(association.fFirstName, association.fFirstClass)
+  auto builder = DefineClass(association.fClassName, "");
+  builder.KeyReference(association.fFirstName, association.fFirstClass)
       .KeyReference(association.fSecondName, association.fSecondClass);
+  for (TRecordProperty const& property : more.GetProperties()) DeclareProperty(builder, property);
 }
 
 TCIMValue TRecordWriter::ReferenceTo(TRecord const& record) const {

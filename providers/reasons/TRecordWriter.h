@@ -56,7 +56,9 @@ public:
 
   // Adds an association of the instances of two records, both of which must have been written: otherwise throws
   // kZEPStatusNotFound. The first call for an association declares its class. The references are its keys.
+  // `more`: further properties of the association, the same ones in each call for its class.
   void Associate(TAssociation const& association, TRecord const& first, TRecord const& second);
+  void Associate(TAssociation const& association, TRecord const& first, TRecord const& second, TRecord const& more);
 
   // Records why a property is missing in an instance that was added to the namespace directly. `path` is its object path
   // without the namespace, as ICIMInstance::GetPath(...).GetPath() returns it.
@@ -67,12 +69,12 @@ public:
 
 private:
   void Declare(TRecord const& shape);
-  void AddInstance(TRecord const& record);
+  void AddInstance(TRecord const& record, TMemoryValues values = {});
 
   bool HasClass(std::string const& name) const;
   TMemoryClassBuilder DefineClass(std::string const& name, std::string superClass);
   void EnsureClass(std::string const& name);
-  void DeclareAssociation(TAssociation const& association);
+  void DeclareAssociation(TAssociation const& association, TRecord const& more);
   TCIMValue ReferenceTo(TRecord const& record) const;
 
   TMemoryNamespace& fNamespace;

@@ -213,6 +213,21 @@ TEST_F(TSchemaRecordTest, InstancesAreAssociated) {
                           testing::HasSubstr("DeviceID=\"fan\"")));
 }
 
+TEST_F(TSchemaRecordTest, AnAssociationMayHaveProperties) {
+  TRecord const hub = Device("CIM_USBHub", "usb1"), device = Device("CIM_USBDevice", "1-1");
+  fWriter.Write(device);
+  fWriter.Write(hub);
+  TRecord connection("CIM_DeviceConnection", "sysfs");
+  connection.Add("NegotiatedSpeed", TFinding<unsigned long>(480)).Unit("bit / second");
+  connection.Add("NegotiatedDataWidth", TFinding<unsigned int>(kUnreadable));
+  fWriter.Associate({"CIM_DeviceConnection", "Antecedent", "CIM_LogicalDevice", "Dependent", "CIM_LogicalDevice"}, hub, device,
+                    connection);
+  fWriter.WriteMissing();
+  EXPECT_THAT(InstancesOf("CIM_DeviceConnection"), ElementsAre(testing::EndsWith(" <480> <NULL>")));
+  EXPECT_EQ(QualifierOf("CIM_DeviceConnection", "NegotiatedSpeed", "PUnit"), "bit / second");
+  EXPECT_THAT(InstancesOf("ZEP_MissingValue"), ElementsAre(testing::EndsWith("<unreadable> <the file cannot be read>")));
+}
+
 TEST_F(TSchemaRecordTest, OnlyWrittenRecordsAreAssociated) {
   fWriter.Write(System());
   fWriter.Write(Device("CIM_DiskDrive", "sda"));
