@@ -2,6 +2,7 @@
 #pragma once
 
 #include "TMemoryClassBuilder.h"
+#include "TMemoryValues.h"
 #include "TRecord.h"
 
 #include <map>
