@@ -4,12 +4,10 @@
 #include "INamespaceProvider.h"
 #include "TRootObject.h"
 #include "collect/process/EStage.h"
+#include "collect/process/SharedObject.h"
 #include "collect/process/TimedFailure.h"
 
-#include <cxxabi.h>
-
 #include <algorithm>
-#include <cstdlib>
 #include <map>
 #include <stdexcept>
 
@@ -52,19 +50,6 @@ TPlugIn Load(TPlugInFile const& file, std::string const& sampleLabel) {
   for (auto const& [providerName, provider] : RegisteredProviders())
     if (before.count(providerName) == 0) plugIn.fProviders.push_back(Fill(providerName, provider, sampleLabel));
   return plugIn;
-}
-
-// The text with each mangled name of C++ in it, as the dynamic linker writes it, replaced by the name in the source.
-std::string Demangled(std::string const& text) {
-  std::string const characters = "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789_";
-  std::size_t const start = text.find("_Z");
-  if (start == text.npos) return text;
-  std::size_t const end = std::min(text.find_first_not_of(characters, start), text.size());
-  int status = 0;
-  std::unique_ptr<char, void (*)(void*)> const name(
-      abi::__cxa_demangle(text.substr(start, end - start).c_str(), nullptr, nullptr, &status), std::free);
-  std::string const rest = Demangled(text.substr(end));
-  return text.substr(0, start) + (name ? name.get() : text.substr(start, end - start)) + rest;
 }
 
 // "kZEPStatusAccessDenied (fill, libTest.nsp.so); last log line: [Error] no disk". A line that repeats the error is left out.

@@ -5,12 +5,21 @@
 #include "collect/Sample.h"
 #include "collect/TNamespaceView.h"
 
+#include <cstdint>
 #include <memory>
 #include <optional>
 #include <string>
 #include <vector>
 
 namespace NQRVZEP20 {
+
+// The cost of reading the instances of one class, which the process of the plug-in measured.
+struct TClassCost {
+  std::string fClass;
+  std::uint64_t fInstances = 0;  // of the class itself, without subclasses
+  double fMilliseconds = 0;      // the time to enumerate the instances, and to read and serialise their values
+  std::uint64_t fPeakBytes = 0;  // the highest growth of the memory meanwhile
+};
 
 // The result of one provider that a plug-in registered.
 struct TProviderRun {
@@ -20,6 +29,15 @@ struct TProviderRun {
   std::string fError;                           // why the provider failed; empty when it succeeded
   std::string fStage = {};                      // the stage that failed: "registration" or "fill"; otherwise empty
   std::string fLastLogLine = {};                // the last before the failure: "[Error] no disk"; empty if unknown
+  bool fExceedsLimit = false;                   // whether it failed because of a limit (ApartLimits.h)
+  std::uint64_t fPeakBytes = 0;                 // the highest growth of the memory during the fill; 0 if not measured
+  std::vector<TClassCost> fCosts = {};          // in the order of the enumeration; empty if not measured
+};
+
+// The descriptors and processes that a plug-in had left when all its namespaces were filled.
+struct TTraces {
+  std::vector<std::string> fDescriptors;  // "5 (/etc/hostname)"
+  std::vector<std::string> fProcesses;    // "1234 (sleep)"
 };
 
 // One provider plug-in: a library lib*.nsp.so in the directory of libzepcore.so, or one that is tried from elsewhere.
@@ -29,9 +47,12 @@ struct TPlugIn {
   double fMilliseconds;  // the time to load the library
   std::string fError;    // why the library could not be loaded; empty when it was
   std::vector<TProviderRun> fProviders;
-  std::string fStage = {};        // the stage that failed: "open", "static construction" or "registration"; otherwise empty
-  std::string fLastLogLine = {};  // the last before the failure; empty if unknown
-  std::string fWords = {};        // its printed output, without the middle if it is long; empty if unknown
+  std::string fStage = {};              // the stage that failed: "open", "static construction" or "registration"; otherwise empty
+  std::string fLastLogLine = {};        // the last before the failure; empty if unknown
+  std::string fWords = {};              // its printed output, without the middle if it is long; empty if unknown
+  bool fExceedsLimit = false;           // whether it failed because of a limit (ApartLimits.h)
+  std::uint64_t fPeakBytes = 0;         // the highest growth of the memory during the load; 0 if not measured
+  std::optional<TTraces> fTraces = {};  // none if not measured, or if the process ended too early
 
   bool HasFailed() const;  // the plug-in itself or one of its providers
 };

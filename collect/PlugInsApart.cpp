@@ -58,7 +58,8 @@ private:
         continue;
       }
       try {
-        fRunning.push_back({fNext, std::make_unique<TPlugInProcess>(file.fName, file.fFile, fOptions.fLimits, fSampleLabel)});
+        fRunning.push_back({fNext, std::make_unique<TPlugInProcess>(file.fName, file.fFile, fOptions.fLimits, fSampleLabel,
+                                                                    fOptions.fMeasures)});
       } catch (std::system_error const& failure) {
         if (!fRunning.empty()) return;  // it may be possible when another one has ended
         fResults[fNext] = {file.fName, file.fFile, 0, failure.what(), {}, NameOf(EStage::kOpen)};

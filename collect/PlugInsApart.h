@@ -23,6 +23,9 @@ struct TApartOptions {
   TApartLimits fLimits;
   std::size_t fParallel = 0;  // the maximum number of concurrent processes; 0: the number of processors that this process may use
 
+  // Whether the processes also measure the memory and the cost of each class (TClassCost), and look for traces (TTraces).
+  bool fMeasures = false;
+
   // Called several times a second with the plug-ins that are running, and at the end with none. May be empty.
   std::function<void(std::vector<TPlugInAtWork> const&)> fShowProgress;
 };

@@ -4,6 +4,7 @@
 // same as that of all bytes at once, and each row of it a namespace or a short failure.
 
 #include "TLogger.h"
+#include "collect/process/Costs.h"
 #include "collect/process/TPlugInAnswer.h"
 #include "fuzz/Require.h"
 
@@ -21,6 +22,19 @@ std::string Row(std::string const& name, std::string const& error, std::string c
   return name + "\n" + error + "\n" + stage + "\n";
 }
 
+std::string TextOf(std::optional<TTraces> const& traces) {
+  std::string text;
+  if (!traces) return text;
+  for (auto const* list : {&traces->fDescriptors, &traces->fProcesses}) {
+    Require(list->size() <= kMostTraces);
+    for (std::string const& trace : *list) {
+      Require(trace.size() <= kLongestFailure);
+      text += trace + "\n";
+    }
+  }
+  return text + "complete\n";
+}
+
 std::string ResultOf(std::string_view bytes, std::size_t pieceSize) {
   TApartLimits limits;
   limits.fAnswerBytes = 2000;
@@ -35,8 +49,10 @@ std::string ResultOf(std::string_view bytes, std::size_t pieceSize) {
   for (TProviderRun const& run : plugIn.fProviders) {
     Require((run.fView != nullptr) == run.fError.empty());
     Require(run.fName.size() <= kLongestName);
-    result += Row(run.fName, run.fError, run.fStage);
+    result += Row(run.fName, run.fError, run.fStage) + std::to_string(run.fPeakBytes) + "\n";
+    for (TClassCost const& cost : run.fCosts) result += BytesOf(cost) + "\n";
   }
+  result += TextOf(plugIn.fTraces);
   return result;
 }
 

@@ -41,6 +41,8 @@ constexpr std::uint64_t kMostElementsInAll = 2'000'000;
 constexpr std::uint64_t kMostInstances = 2'000'000;
 constexpr std::uint64_t kMostValues = 50'000'000;  // including array elements and keys
 
+constexpr std::uint64_t kMostTraces = 100;  // descriptors, and processes, that a plug-in leaves: each is a line of a check
+
 // Bytes of the messages that are no namespaces: names, stages, times and failures.
 constexpr std::uint64_t kMostOtherBytes = 16 * 1024 * 1024;
 

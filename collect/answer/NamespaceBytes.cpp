@@ -293,8 +293,9 @@ private:
 
 class TInstanceWriter {
 public:
-  TInstanceWriter(TSchema const& schema, TByteWriter& writer, std::function<void(std::string_view)> const& send)
-      : fSchema(schema), fWriter(writer), fSend(send), fLayoutsOf(schema.Classes().size()) {}
+  TInstanceWriter(TSchema const& schema, TByteWriter& writer, std::function<void(std::string_view)> const& send,
+                  std::function<void(std::string const&)> const& noteInstance)
+      : fSchema(schema), fWriter(writer), fSend(send), fNoteInstance(noteInstance), fLayoutsOf(schema.Classes().size()) {}
 
   void Write() {
     for (std::size_t number = 0; number < fSchema.Classes().size(); ++number)
@@ -340,6 +341,7 @@ private:
     WritePath(instance, cls, fLayouts[layout]);
     fWriter.Raw(fRecord.Bytes());
     if (fWriter.Bytes().size() >= kPieceBytes) Send();
+    if (fNoteInstance) fNoteInstance(fSchema.Classes()[cls]->GetName(kNone));
   }
 
   void BeginRecord(std::size_t layout) {
@@ -490,6 +492,7 @@ private:
   TSchema const& fSchema;
   TByteWriter& fWriter;
   std::function<void(std::string_view)> const& fSend;
+  std::function<void(std::string const&)> const& fNoteInstance;
   std::vector<TLayout> fLayouts;
   std::vector<std::vector<std::size_t>> fLayoutsOf;  // by class
 
@@ -501,11 +504,12 @@ private:
 
 }  // namespace
 
-void WriteNamespace(ICIMNamespace const& ns, std::function<void(std::string_view bytes)> const& send) {
+void WriteNamespace(ICIMNamespace const& ns, std::function<void(std::string_view bytes)> const& send,
+                    std::function<void(std::string const& className)> const& noteInstance) {
   TByteWriter writer;
   TSchema const schema(ns);
   TSchemaWriter(ns, schema, writer).Write();
-  TInstanceWriter(schema, writer, send).Write();
+  TInstanceWriter(schema, writer, send, noteInstance).Write();
 }
 
 }  // namespace NQRVZEP20

@@ -10,6 +10,7 @@
 #include <chrono>
 #include <filesystem>
 #include <fstream>
+#include <string>
 
 namespace NQRVZEP20 {
 
@@ -22,10 +23,10 @@ bool Contains(std::vector<pid_t> const& ids, pid_t id) { return std::find(ids.be
 
 }  // namespace
 
-std::vector<pid_t> Children() {
+std::vector<pid_t> Children(pid_t process) {
   std::vector<pid_t> children;
   std::error_code error;
-  for (auto const& thread : std::filesystem::directory_iterator("/proc/self/task", error)) {
+  for (auto const& thread : std::filesystem::directory_iterator("/proc/" + std::to_string(process) + "/task", error)) {
     std::ifstream list(thread.path() / "children");
     for (pid_t child; list >> child;) children.push_back(child);
   }

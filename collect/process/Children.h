@@ -2,13 +2,15 @@
 #pragma once
 
 #include <sys/types.h>
+#include <unistd.h>
 
 #include <vector>
 
 namespace NQRVZEP20 {
 
-// The children of this process, including zombies. Empty on a kernel that was built without CONFIG_PROC_CHILDREN.
-std::vector<pid_t> Children();
+// The children of a process, by default this one, including zombies. Empty when it does not exist, and on a kernel that was built
+// without CONFIG_PROC_CHILDREN.
+std::vector<pid_t> Children(pid_t process = ::getpid());
 
 // Becomes the parent of processes whose parent has ended, as init usually does, and ends them. The constructor and the destructor
 // change this for the whole process (PR_SET_CHILD_SUBREAPER). Use it while no other part of the program starts processes.

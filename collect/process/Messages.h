@@ -10,17 +10,21 @@ namespace NQRVZEP20 {
 
 // The messages that a plug-in process sends: one byte for the kind, four bytes for the length of the text, and the text.
 enum class EMessage : unsigned char {
-  kStage,       // a stage of loading begins: one byte, an EStage
-  kRegistered,  // a provider has been registered: its name
-  kTaken,       // a provider has not been registered, because its name is taken: the name
-  kLoaded,      // loading has ended: the time in microseconds, as text
-  kFilling,     // a provider begins to fill its namespace: its name
-  kBytes,       // a chunk of the serialised namespace (NamespaceBytes.h)
-  kFilled,      // the namespace is complete: the time to fill it in microseconds, as text
-  kFailed,      // loading, or the provider, has failed: why. Later messages are about the next provider
-  kFatal,       // the same, but the process ends
-  kExits,       // the plug-in has called exit: the status, as text
-  kDone         // nothing more follows; the last kind
+  kStage,        // a stage of loading begins: one byte, an EStage
+  kRegistered,   // a provider has been registered: its name
+  kTaken,        // a provider has not been registered, because its name is taken: the name
+  kLoaded,       // loading has ended: the time in microseconds, as text
+  kFilling,      // a provider begins to fill its namespace: its name
+  kBytes,        // a chunk of the serialised namespace (NamespaceBytes.h)
+  kFilled,       // the namespace is complete: the time to fill it in microseconds, as text
+  kFailed,       // loading, or the provider, has failed: why. Later messages are about the next provider
+  kFatal,        // the same, but the process ends
+  kExits,        // the plug-in has called exit: the status, as text
+  kCost,         // the measured cost of the step that has ended (Costs.h)
+  kLeftOpen,     // a descriptor that the plug-in leaves open: its number and target. Sent before kTraced
+  kLeftRunning,  // a process that the plug-in leaves running: its number and name. Sent before kTraced
+  kTraced,       // all descriptors and processes that the plug-in leaves have been sent
+  kDone          // nothing more follows; the last kind
 };
 
 struct TMessage {

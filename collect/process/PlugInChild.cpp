@@ -5,12 +5,14 @@
 #include "TRootObject.h"
 #include "collect/PlugInFiles.h"
 #include "collect/answer/NamespaceBytes.h"
+#include "collect/process/Costs.h"
 #include "collect/process/Descriptors.h"
 #include "collect/process/EStage.h"
 #include "collect/process/Messages.h"
 #include "collect/process/SharedObject.h"
 #include "collect/process/TWatchedRegistry.h"
 #include "collect/process/TimedFailure.h"
+#include "collect/process/Traces.h"
 
 #include <fcntl.h>
 #include <stdlib.h>
@@ -26,7 +28,9 @@
 #include <exception>
 #include <fstream>
 #include <iostream>
+#include <map>
 #include <mutex>
+#include <optional>
 #include <stdexcept>
 
 namespace NQRVZEP20 {
@@ -170,39 +174,65 @@ bool IsOfLinker(TTimedFailure const& failure) {
   return !failure.fReason.empty() && failure.fMessage == TZEPStatusCode(kZEPStatusFileSystemError).TranslateStatusCode();
 }
 
+// Does the step; if it is to be measured, sends the growth of the memory.
+template <class TStep>
+TTimedFailure MeasuredFailureOf(bool isMeasured, TStep step) {
+  std::optional<TMemoryMeter> memory;
+  if (isMeasured) memory.emplace();
+  TTimedFailure const failure = TimedFailureOf(step);
+  if (memory) Send(EMessage::kCost, BytesOf({"", 0, 0, memory->PeakBytes()}));
+  return failure;
+}
+
 void Load(TChildSetup const& setup) {
   SendStage(EStage::kOpen);
   bool const runsItsCode = CanBeMapped(setup.fFile);
   if (runsItsCode) SendStage(EStage::kConstruction);
-  TTimedFailure const failure = TimedFailureOf([&] { LoadLibraryOf({setup.fName, setup.fFile}); });
+  TTimedFailure const failure = MeasuredFailureOf(setup.fMeasures, [&] { LoadLibraryOf({setup.fName, setup.fFile}); });
   if (IsOfLinker(failure)) SendStage(EStage::kOpen);
   if (!failure.fMessage.empty()) Send(EMessage::kFailed, failure.ReasonOrMessage());
   SendTime(EMessage::kLoaded, failure.fMilliseconds);
 }
 
-void Fill(INamespaceProvider& provider) {
+void Serialise(ICIMNamespace const& ns, bool isMeasured) {
+  auto const send = [](std::string_view bytes) { Send(EMessage::kBytes, bytes); };
+  if (!isMeasured) return WriteNamespace(ns, send);
+  TClassMeter meter;
+  WriteNamespace(ns, send, [&](std::string const& className) { meter.Note(className); });
+  for (TClassCost const& cost : meter.Finish()) Send(EMessage::kCost, BytesOf(cost));
+}
+
+void Fill(INamespaceProvider& provider, bool isMeasured) {
   Send(EMessage::kFilling, provider.GetName(TCIMContext()));
   boost::shared_ptr<ICIMNamespace> ns;
-  TTimedFailure failure = TimedFailureOf([&] {
+  TTimedFailure failure = MeasuredFailureOf(isMeasured, [&] {
     ns = provider.GetNamespace(TCIMContext());
     if (!ns) throw std::runtime_error("it has no namespace");
   });
   double const milliseconds = failure.fMilliseconds;
-  if (failure.fMessage.empty())
-    failure = TimedFailureOf([&] { WriteNamespace(*ns, [](std::string_view bytes) { Send(EMessage::kBytes, bytes); }); });
+  if (failure.fMessage.empty()) failure = TimedFailureOf([&] { Serialise(*ns, isMeasured); });
   if (failure.fMessage.empty())
     SendTime(EMessage::kFilled, milliseconds);
   else
     Send(EMessage::kFailed, failure.MessageAndReason());
 }
 
+void SendTraces(std::map<int, std::string> const& openBefore) {
+  TTraces const traces = TracesSince(openBefore);
+  for (std::string const& descriptor : traces.fDescriptors) Send(EMessage::kLeftOpen, descriptor);
+  for (std::string const& process : traces.fProcesses) Send(EMessage::kLeftRunning, process);
+  Send(EMessage::kTraced, "");
+}
+
 }  // namespace
 
 void RunPlugIn(TChildSetup const& setup) {
   SetUp(setup);
+  auto const openBefore = setup.fMeasures ? OpenDescriptors() : std::map<int, std::string>();
   auto const registry = WatchRegistry();
   Load(setup);
-  for (auto const& provider : registry->NewProviders()) Fill(*provider);
+  for (auto const& provider : registry->NewProviders()) Fill(*provider, setup.fMeasures);
+  if (setup.fMeasures) SendTraces(openBefore);
   FlushWords();
   Send(EMessage::kDone, "");
   ::_exit(0);

@@ -14,6 +14,7 @@ struct TChildSetup {
   int fWords;                  // the descriptor for standard output and standard error
   int fLog;                    // the descriptor to which the log is written
   std::uint64_t fMemoryBytes;  // the memory that the process may use in addition; 0: no limit
+  bool fMeasures;              // whether costs and traces are measured
 };
 
 // Loads the plug-in into this process, calls its providers to fill their namespaces, and sends the result. Then exits.

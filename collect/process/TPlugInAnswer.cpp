@@ -4,6 +4,7 @@
 #include "collect/FailureOf.h"
 #include "collect/SafeText.h"
 #include "collect/answer/TReceivedNamespace.h"
+#include "collect/process/Costs.h"
 
 #include <algorithm>
 #include <charconv>
@@ -58,6 +59,14 @@ void TPlugInAnswer::Take(TMessage const& message) {
     case EMessage::kExits:
       fEnding = "it exited with status " + text;
       return;
+    case EMessage::kCost:
+      return TakeCost(text);
+    case EMessage::kLeftOpen:
+    case EMessage::kLeftRunning:
+      return TakeTrace(message);
+    case EMessage::kTraced:
+      fResult.fTraces = fTraces;
+      return;
     case EMessage::kDone:
       fState = EState::kDone;
       return;
@@ -100,7 +109,28 @@ void TPlugInAnswer::TakeNamespace(std::string const& microseconds) {
   fProvider.reset();
 }
 
-void TPlugInAnswer::Fail(std::string why) {
+// A cost without a class is that of the load or the fill that is under way.
+void TPlugInAnswer::TakeCost(std::string const& bytes) {
+  TProviderRun* const run = CurrentRun();
+  TClassCost cost;
+  std::string const failure = FailureOf([&] { cost = CostFrom(bytes); });
+  if (!failure.empty()) return Refuse("a cost is invalid: " + failure);
+  if (cost.fClass.empty()) {
+    (run != nullptr ? run->fPeakBytes : fResult.fPeakBytes) = cost.fPeakBytes;
+  } else if (++fCosts > kMostClasses) {
+    Refuse("there are more than " + std::to_string(kMostClasses) + " classes with a cost");
+  } else if (run != nullptr) {
+    run->fCosts.push_back(std::move(cost));
+  }
+}
+
+void TPlugInAnswer::TakeTrace(TMessage const& message) {
+  auto& traces = message.fKind == EMessage::kLeftOpen ? fTraces.fDescriptors : fTraces.fProcesses;
+  if (traces.size() >= kMostTraces) return Refuse("it names more than " + std::to_string(kMostTraces) + " traces of a kind");
+  traces.push_back(Shortened(message.fText, kLongestFailure));
+}
+
+void TPlugInAnswer::Fail(std::string why, bool exceedsLimit) {
   if (!fProvider && !fResult.fError.empty()) return;
   if (why.empty()) why = "it failed without a reason";
   bool const isOutOfMemory = fLimits.fMemoryMebibytes != 0 && why.find("std::bad_alloc") != why.npos;
@@ -108,6 +138,7 @@ void TPlugInAnswer::Fail(std::string why) {
   TProviderRun* const run = CurrentRun();
   (run != nullptr ? run->fError : fResult.fError) = Shortened(why, kLongestFailure);
   (run != nullptr ? run->fStage : fResult.fStage) = NameOf(run != nullptr ? EStage::kFill : fStage);
+  (run != nullptr ? run->fExceedsLimit : fResult.fExceedsLimit) = exceedsLimit || isOutOfMemory;
   (run != nullptr ? run->fLastLogLine : fResult.fLastLogLine) = fLastLogLine();
   if (run != nullptr) fProvider.reset();
 }

@@ -38,8 +38,8 @@ public:
   std::optional<std::string> const& Ending() const { return fEnding; }
 
   // The failure of the provider that is filling its namespace, or else of the plug-in, of which the first one counts. A long text
-  // is cut.
-  void Fail(std::string why);
+  // is cut. `exceedsLimit`: whether the cause is a limit (ApartLimits.h).
+  void Fail(std::string why, bool exceedsLimit = false);
 
   // Ends the answer. Providers whose namespace was not filled have failed.
   TPlugIn Finish(std::string words);
@@ -49,6 +49,8 @@ private:
   void TakeName(TMessage const& message);
   void TakeLoaded(std::string const& microseconds);
   void TakeNamespace(std::string const& microseconds);
+  void TakeCost(std::string const& bytes);
+  void TakeTrace(TMessage const& message);
   void Begin(EStage stage);
   void Refuse(std::string why);
   std::optional<double> MillisecondsIn(std::string const& microseconds);  // refuses what is not a number
@@ -68,6 +70,8 @@ private:
   std::uint64_t fAnswerBytes = 0;  // of all namespaces
   std::uint64_t fOtherBytes = 0;   // of all other messages, and of the heads of all
   TAnswerCounts fCounts;
+  std::uint64_t fCosts = 0;  // the number of classes with a cost
+  TTraces fTraces;           // of the result when they are complete
 
   EStage fStage = EStage::kOpen;
   TClock::time_point fStageBegan = TClock::now();

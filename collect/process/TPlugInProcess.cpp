@@ -56,7 +56,7 @@ bool HasInput(int fd, std::chrono::milliseconds wait) {
 }  // namespace
 
 TPlugInProcess::TPlugInProcess(std::string const& name, std::string const& file, TApartLimits const& limits,
-                               std::string sampleLabel)
+                               std::string sampleLabel, bool measures)
     : fLimits(limits),
       fResult{name, file, 0, "", {}},
       fAnswer(name, file, limits, std::move(sampleLabel),
@@ -65,7 +65,7 @@ TPlugInProcess::TPlugInProcess(std::string const& name, std::string const& file,
                 return LastLogLineOf(fLog);
               }),
       fWords(kMostWords) {
-  Start(limits);
+  Start(limits, measures);
   fDeadline = TClock::now() + std::chrono::seconds(limits.fTimeoutSeconds);
 }
 
@@ -75,10 +75,15 @@ TPlugInProcess::~TPlugInProcess() {
   EndSupervisor();
 }
 
-void TPlugInProcess::Start(TApartLimits const& limits) {
+void TPlugInProcess::Start(TApartLimits const& limits, bool measures) {
   TPipe control = OpenPipe(), answer = OpenPipe(), words = OpenPipe(), log = OpenPipe(), verdict = OpenPipe();
-  TChildSetup const setup{fResult.fName,         fResult.fFile,       answer.fWriteEnd.get(),
-                          words.fWriteEnd.get(), log.fWriteEnd.get(), limits.fMemoryMebibytes * 1024 * 1024};
+  TChildSetup const setup{fResult.fName,
+                          fResult.fFile,
+                          answer.fWriteEnd.get(),
+                          words.fWriteEnd.get(),
+                          log.fWriteEnd.get(),
+                          limits.fMemoryMebibytes * 1024 * 1024,
+                          measures};
   fSupervisor = ForkOrThrow();
   if (fSupervisor == 0) {
     control.fWriteEnd.release();  // closed with all others, so that the end of the owner is seen
@@ -200,7 +205,8 @@ void TPlugInProcess::Complete() {
   fAnswerEnd.reset();
   ReadWords();
   ReadLog();
-  if (fEnding != EEnding::kDone) fAnswer.Fail(WhyDead());
+  bool const exceedsLimit = fEnding == EEnding::kTimeUp || fEnding == EEnding::kTooLong;
+  if (fEnding != EEnding::kDone) fAnswer.Fail(WhyDead(), exceedsLimit);
   fResult = fAnswer.Finish(fWords.Get());
   fHasEnded = true;
 }

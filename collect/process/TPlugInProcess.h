@@ -25,8 +25,10 @@ class TPlugInProcess {
 public:
   using TClock = TPlugInAnswer::TClock;
 
-  // Starts the process. If a pipe or process cannot be created, throws std::system_error and leaks nothing.
-  TPlugInProcess(std::string const& name, std::string const& file, TApartLimits const& limits, std::string sampleLabel);
+  // Starts the process, which also measures (TApartOptions) if `measures` is true. If a pipe or process cannot be created, throws
+  // std::system_error and leaks nothing.
+  TPlugInProcess(std::string const& name, std::string const& file, TApartLimits const& limits, std::string sampleLabel,
+                 bool measures);
   ~TPlugInProcess();
   TPlugInProcess(TPlugInProcess const&) = delete;
   TPlugInProcess& operator=(TPlugInProcess const&) = delete;
@@ -55,7 +57,7 @@ public:
 private:
   enum class EEnding { kNone, kDone, kTimeUp, kTooLong, kBadAnswer, kClosed };
 
-  void Start(TApartLimits const& limits);
+  void Start(TApartLimits const& limits, bool measures);
   void ReadAnswer();
   void ReadWords();
   void ReadLog();

@@ -5,6 +5,8 @@
 
 #include <sys/stat.h>
 
+#include <algorithm>
+
 namespace NQRVZEP20 {
 namespace {
 
@@ -28,6 +30,45 @@ TEST(SharedObjectTest, APlugInThatIsCutOffCannotBeMapped) {
     WriteFile(dir.Path("cut"), plugIn.substr(0, size));
     EXPECT_FALSE(CanBeMapped(dir.Path("cut"))) << size;
   }
+}
+
+TEST(SharedObjectTest, ExportedSymbolsAreThoseOfTheDynamicSymbolTable) {
+  auto const symbols = ExportedSymbols(TEST_LIBZEPCORE);
+  ASSERT_TRUE(symbols);
+  EXPECT_EQ(std::count(symbols->begin(), symbols->end(), "_ZNK9NQRVZEP2013TZEPException4whatEv"), 1);
+  EXPECT_EQ(std::count(symbols->begin(), symbols->end(), "malloc"), 0) << "it is used, but not defined";
+  EXPECT_EQ(std::count(symbols->begin(), symbols->end(), "_init"), 0);
+}
+
+TEST(SharedObjectTest, OtherFilesHaveNoExportedSymbols) {
+  TTempDir const dir;
+  EXPECT_FALSE(ExportedSymbols(dir.Path("missing")));
+  EXPECT_FALSE(ExportedSymbols("/dev/null"));
+  WriteFile(dir.Path("text"), std::string(1000, 'x'));
+  EXPECT_FALSE(ExportedSymbols(dir.Path("text")));
+}
+
+// The file is cut off, or has a byte of its headers or section table changed.
+TEST(SharedObjectTest, ADamagedFileIsReadWithinItsBounds) {
+  TTempDir const dir;
+  std::string const plugIn = ReadFile(TEST_PROVIDER);
+  for (std::size_t size = 0; size < plugIn.size(); size += plugIn.size() / 50) {
+    WriteFile(dir.Path("cut"), plugIn.substr(0, size));
+    EXPECT_FALSE(ExportedSymbols(dir.Path("cut"))) << size;
+  }
+  for (std::size_t at = 0; at < 2000; ++at) {
+    std::string changed = plugIn;
+    std::size_t const place = at < 64 ? at : changed.size() - at;
+    changed[place] = static_cast<char>(changed[place] ^ 0xff);
+    WriteFile(dir.Path("changed"), changed);
+    auto const symbols = ExportedSymbols(dir.Path("changed"));
+    EXPECT_LE(symbols ? symbols->size() : 0, plugIn.size());
+  }
+}
+
+TEST(SharedObjectTest, MangledNamesInATextBecomeThoseOfTheSource) {
+  EXPECT_EQ(Demangled("x.so: undefined symbol: _Z3Fani, _ZN1AC1Ev"), "x.so: undefined symbol: Fan(int), A::A()");
+  EXPECT_EQ(Demangled("_Z is no name, plain"), "_Z is no name, plain");
 }
 
 }  // namespace

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/process/TPlugInAnswer.h"
 
+#include "collect/process/Costs.h"
 #include "providers/memory/TMemoryNamespace.h"
 #include "tests/collect/answer/Bytes.h"
 
@@ -175,6 +176,57 @@ TEST_F(TPlugInAnswerTest, OtherMessagesWithoutEndAreRefused) {
     for (int n = 0; n < 100; ++n) answer->Add(bytes);
     EXPECT_EQ(answer->WhyBad(), "its messages exceed 16777216 bytes");
   }
+}
+
+TEST_F(TPlugInAnswerTest, CostsBelongToTheirStep) {
+  auto const answer = AnswerOf({{EMessage::kCost, BytesOf({"", 0, 0, 10})},
+                                {EMessage::kCost, BytesOf({"X_Early", 1, 2, 3})},
+                                {EMessage::kFilling, "A"},
+                                {EMessage::kCost, BytesOf({"", 0, 0, 20})},
+                                {EMessage::kBytes, kDisks},
+                                {EMessage::kCost, BytesOf({"X_Disk", 7, 1.5, 30})},
+                                {EMessage::kFilled, "3"}});
+  TPlugIn const plugIn = answer->Finish("");
+  EXPECT_EQ(AsText(plugIn), "A: filled root/disks");
+  EXPECT_EQ(plugIn.fPeakBytes, 10u);
+  TProviderRun const& run = plugIn.fProviders.at(0);
+  EXPECT_EQ(run.fPeakBytes, 20u);
+  ASSERT_EQ(run.fCosts.size(), 1u);
+  EXPECT_EQ(run.fCosts[0].fClass, "X_Disk");
+  EXPECT_EQ(run.fCosts[0].fInstances, 7u);
+  EXPECT_DOUBLE_EQ(run.fCosts[0].fMilliseconds, 1.5);
+  EXPECT_EQ(run.fCosts[0].fPeakBytes, 30u);
+}
+
+TEST_F(TPlugInAnswerTest, TracesCountWhenTheyAreComplete) {
+  TMessages messages = {{EMessage::kLeftOpen, "5 (/tmp/x)"}, {EMessage::kLeftRunning, "12 (sleep)"}};
+  EXPECT_FALSE(AnswerOf(messages)->Finish("").fTraces);
+  messages.push_back({EMessage::kTraced, ""});
+  TPlugIn const plugIn = AnswerOf(messages)->Finish("");
+  ASSERT_TRUE(plugIn.fTraces);
+  EXPECT_EQ(plugIn.fTraces->fDescriptors, std::vector<std::string>{"5 (/tmp/x)"});
+  EXPECT_EQ(plugIn.fTraces->fProcesses, std::vector<std::string>{"12 (sleep)"});
+}
+
+TEST_F(TPlugInAnswerTest, MeasurementsThatAreWrongOrWithoutEndAreRefused) {
+  for (std::string const& cost :
+       {std::string(), std::string("\x01"), BytesOf({"X", 1, 1, 1}) + "x", BytesOf({std::string(1025, 'X'), 1, 1, 1})})
+    EXPECT_THAT(AnswerOf({{EMessage::kCost, cost}})->WhyBad(), HasSubstr("a cost is invalid: "));
+  EXPECT_EQ(AnswerOf(TMessages(kMostTraces, {EMessage::kLeftOpen, "x"}))->WhyBad(), "");
+  EXPECT_EQ(AnswerOf(TMessages(kMostTraces + 1, {EMessage::kLeftOpen, "x"}))->WhyBad(),
+            "it names more than 100 traces of a kind");
+  EXPECT_EQ(AnswerOf(TMessages(kMostClasses + 1, {EMessage::kCost, BytesOf({"X", 1, 1, 1})}))->WhyBad(),
+            "there are more than 100000 classes with a cost");
+}
+
+TEST_F(TPlugInAnswerTest, AFailureBecauseOfALimitIsMarked) {
+  auto const plain = AnswerOf({{EMessage::kFailed, "no disk"}});
+  EXPECT_FALSE(plain->Finish("").fExceedsLimit);
+  auto const late = AnswerOf({{EMessage::kFilling, "A"}});
+  late->Fail("too late", true);
+  TPlugIn const plugIn = late->Finish("");
+  EXPECT_FALSE(plugIn.fExceedsLimit);
+  EXPECT_TRUE(plugIn.fProviders.at(0).fExceedsLimit);
 }
 
 TEST_F(TPlugInAnswerTest, ALongFailureIsCut) {
