@@ -33,6 +33,9 @@ nm --dynamic --defined-only "$plugin" >"$work/log"
 [[ ! -s $work/log ]] || fail "the plug-in exports symbols:" "$work/log"
 readelf --wide --dynamic "$plugin" | grep -q 'Library runpath: \[\$ORIGIN\]' || fail "the plug-in does not find libzepcore.so beside it"
 
+"$zep" plugin check "$plugin" --mof "$here/everything.mof" >"$work/log" 2>&1 || fail "zep plugin check finds faults:" "$work/log"
+grep -q '^schema  *passed' "$work/log" || fail "its classes are not checked against the schema:" "$work/log"
+
 cmake --install project >"$work/log" || fail "it is not installed:" "$work/log"
 "$zep" report --sample >"$work/log" || true  # an incomplete report is not a failure here
 grep -q 'Everything .*root/everything' "$work/log" || fail "zep report does not list the plug-in:" "$work/log"

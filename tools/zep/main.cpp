@@ -38,7 +38,7 @@ constexpr TCommand kCommands[] = {
     {"plugins", "List the plug-ins, and why files are not loaded as plug-ins", AddPluginsArguments},
     {"mof", "Load and check a schema in MOF", AddMofArguments},
     {"doctor", "Check what works on this host, and name the remedy for what does not", AddDoctorArguments},
-    {"plugin", "Write the project of a new provider plug-in", AddPluginArguments},
+    {"plugin", "Write the project of a new provider plug-in, or check a plug-in", AddPluginArguments},
     {"media", "List, mount and unmount removable media", AddMediaArguments},
     {"config", "Show the settings of zep.cfg as the library reads them", AddConfigArguments},
     {"remote", "Identify servers through their management controllers", AddRemoteArguments},

@@ -26,6 +26,17 @@ void WriteWords(TPlugIn const& plugIn) {
     std::cerr << "zep: plug-in " << Printable(plugIn.fName) << " printed: " << Printable(line) << "\n";
 }
 
+std::vector<TPlugIn> LoadApart(std::vector<TPlugInFile> const& files, std::optional<TSample> const& sample,
+                               TPlugInArguments const& arguments, bool measures) {
+  TPlugInProgress progress;
+  TApartOptions options;
+  options.fLimits.fTimeoutSeconds = arguments.fTimeoutSeconds;
+  options.fLimits.fMemoryMebibytes = arguments.fMemoryMebibytes;
+  options.fMeasures = measures;
+  options.fShowProgress = [&progress](std::vector<TPlugInAtWork> const& atWork) { progress.Show(atWork); };
+  return LoadPlugInsApart(files, sample, options);
+}
+
 }  // namespace
 
 TSample BundledSample() {
@@ -36,30 +47,32 @@ TSample BundledSample() {
 
 std::optional<TSample> SampleIf(bool isWanted) { return isWanted ? std::optional(BundledSample()) : std::nullopt; }
 
+void AddLimitOptions(CLI::App& command, TPlugInArguments& arguments) {
+  command
+      .add_option("--plugin-timeout", arguments.fTimeoutSeconds,
+                  "The time limit in seconds for loading a plug-in, and again for filling its namespaces (default 60)")
+      ->check(CLI::Range(1, 86400));
+  command
+      .add_option("--plugin-memory", arguments.fMemoryMebibytes,
+                  "The memory in MiB that a plug-in process may use in addition to that of zep (default: no limit)")
+      ->check(CLI::Range(1, 1048576));
+  command.add_flag("--allow-writable", arguments.fChoice.fAllowWritable,
+                   "As root, also load plug-ins that other users may replace");
+}
+
 void AddPlugInOptions(CLI::App& command, TPlugInArguments& arguments) {
-  auto* const timeout =
-      command
-          .add_option("--plugin-timeout", arguments.fTimeoutSeconds,
-                      "The time limit in seconds for loading a plug-in, and again for filling its namespaces (default 60)")
-          ->check(CLI::Range(1, 86400));
-  auto* const memory =
-      command
-          .add_option("--plugin-memory", arguments.fMemoryMebibytes,
-                      "The memory in MiB that a plug-in process may use in addition to that of zep (default: no limit)")
-          ->check(CLI::Range(1, 1048576));
+  AddLimitOptions(command, arguments);
   command
       .add_flag("--in-process", arguments.fInProcess,
                 "Load the plug-ins into the zep process, for debugging; a plug-in that crashes or hangs then takes zep with it")
-      ->excludes(timeout)
-      ->excludes(memory);
+      ->excludes("--plugin-timeout")
+      ->excludes("--plugin-memory");
   command
       .add_option("--plugin", arguments.fChoice.fFiles,
                   "Also load this plug-in, from anywhere, without installing it (repeatable); it takes the place of an installed "
                   "plug-in of the same name")
       ->type_name("FILE")
       ->allow_extra_args(false);
-  command.add_flag("--allow-writable", arguments.fChoice.fAllowWritable,
-                   "As root, also load plug-ins that other users may replace");
 }
 
 std::vector<TPlugInFile> FindPlugInsFor(TPlugInArguments const& arguments) {
@@ -79,14 +92,13 @@ std::vector<TPlugIn> LoadPlugInsFor(TPlugInArguments const& arguments, std::opti
     TOutputGuard const guard;
     return LoadPlugIns(files, sample);
   }
-  TPlugInProgress progress;
-  TApartOptions options;
-  options.fLimits.fTimeoutSeconds = arguments.fTimeoutSeconds;
-  options.fLimits.fMemoryMebibytes = arguments.fMemoryMebibytes;
-  options.fShowProgress = [&progress](std::vector<TPlugInAtWork> const& atWork) { progress.Show(atWork); };
-  std::vector<TPlugIn> plugIns = LoadPlugInsApart(files, sample, options);
+  std::vector<TPlugIn> plugIns = LoadApart(files, sample, arguments, false);
   for (TPlugIn const& plugIn : plugIns) WriteWords(plugIn);
   return plugIns;
+}
+
+TPlugIn LoadPlugInMeasured(TPlugInFile const& file, TPlugInArguments const& arguments) {
+  return LoadApart({file}, std::nullopt, arguments, true).front();
 }
 
 }  // namespace NQRVZEP20::zep

@@ -32,6 +32,9 @@ struct TPlugInArguments {
 
 void AddPlugInOptions(CLI::App& command, TPlugInArguments& arguments);
 
+// Only the options for the limits, and --allow-writable: for a command that loads a certain plug-in.
+void AddLimitOptions(CLI::App& command, TPlugInArguments& arguments);
+
 // The files that may be plug-ins.
 std::vector<TPlugInFile> FindPlugInsFor(TPlugInArguments const& arguments);
 
@@ -40,5 +43,9 @@ std::vector<TPlugInFile> FindPlugInsFor(TPlugInArguments const& arguments);
 std::vector<TPlugIn> LoadPlugInsFor(TPlugInArguments const& arguments, std::optional<TSample> const& sample);
 std::vector<TPlugIn> LoadPlugInsFor(TPlugInArguments const& arguments, std::optional<TSample> const& sample,
                                     std::vector<TPlugInFile> const& files);
+
+// Loads this plug-in in a process of its own, which also measures (TApartOptions). Shows progress like LoadPlugInsFor, but does
+// not write the output of the plug-in.
+TPlugIn LoadPlugInMeasured(TPlugInFile const& file, TPlugInArguments const& arguments);
 
 }  // namespace NQRVZEP20::zep
