@@ -78,8 +78,8 @@ std::string TextAt(std::vector<char> const& texts, std::size_t at) {
 
 }  // namespace
 
-bool CanBeMapped(std::string const& name) {
-  TFile const file(name);
+bool CanBeMapped(std::string const& fileName) {
+  TFile const file(fileName);
   auto const header = HeaderOf(file);
   if (!header || header->e_phentsize != sizeof(ElfW(Phdr))) return false;
   auto const segments = file.Read<ElfW(Phdr)>(header->e_phoff, header->e_phnum);
@@ -88,8 +88,8 @@ bool CanBeMapped(std::string const& name) {
          });
 }
 
-std::optional<std::vector<std::string>> ExportedSymbols(std::string const& name) {
-  TFile const file(name);
+std::optional<std::vector<std::string>> ExportedSymbols(std::string const& fileName) {
+  TFile const file(fileName);
   auto const header = HeaderOf(file);
   if (!header || header->e_shentsize != sizeof(ElfW(Shdr))) return std::nullopt;
   auto const sections = file.Read<ElfW(Shdr)>(header->e_shoff, header->e_shnum);

@@ -10,11 +10,11 @@ namespace NQRVZEP20 {
 // Whether the file is a shared object that can be mapped completely: a regular, readable ELF file of this machine's word size
 // whose segments end within the file. The dynamic linker may still refuse it, for example because of a missing symbol; but if a
 // process dies while it loads such a file, the fault is in the file's own code.
-bool CanBeMapped(std::string const& file);
+bool CanBeMapped(std::string const& fileName);
 
 // The names of the symbols that the shared object defines for other libraries, as in its dynamic symbol table, without those that
 // the linker adds to every library. None if the file cannot be mapped or has no such table. No code of the file runs.
-std::optional<std::vector<std::string>> ExportedSymbols(std::string const& file);
+std::optional<std::vector<std::string>> ExportedSymbols(std::string const& fileName);
 
 // The text with each mangled name of C++ in it, as the dynamic linker writes it, replaced by the name in the source.
 std::string Demangled(std::string const& text);

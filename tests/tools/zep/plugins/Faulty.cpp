@@ -15,6 +15,7 @@
 
 #include <csignal>
 #include <cstdio>
+#include <ctime>
 #include <limits>
 #include <map>
 #include <stdexcept>
@@ -73,6 +74,10 @@ std::map<std::string, TFill> const kFills = {
     {"KeyDiffers",
      [](TMemoryNamespace& ns) {
        AddThing(ns, {{"Id", std::to_string(::getpid())}});
+     }},
+    {"TimeIsKey",
+     [](TMemoryNamespace& ns) {
+       AddThing(ns, {{"Id", std::to_string(::time(nullptr))}});
      }},
     {"ClassDiffers", [](TMemoryNamespace& ns) { ns.DefineClass("X_Of" + std::to_string(::getpid())); }},
     {"TypeDiffers",

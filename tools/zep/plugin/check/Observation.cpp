@@ -6,7 +6,9 @@
 #include "collect/process/SharedObject.h"
 #include "tools/zep/plugin/SchemaFile.h"
 
+#include <chrono>
 #include <stdexcept>
+#include <thread>
 
 namespace NQRVZEP20::zep {
 
@@ -17,6 +19,12 @@ TTrial Try(TPlugInFile const& file, TPlugInArguments const& arguments) {
   for (TProviderRun const& run : trial.fPlugIn.fProviders)
     if (run.fView) trial.fContents.push_back(ContentOf(*run.fView));
   return trial;
+}
+
+// A key that contains the time of day then differs from that of the first trial.
+void WaitForNextSecond() {
+  auto const now = std::chrono::system_clock::now();
+  std::this_thread::sleep_for(std::chrono::ceil<std::chrono::seconds>(now) - now + std::chrono::milliseconds(1));
 }
 
 void FindSchema(std::string const& mofFile, TObservation& observation) {
@@ -52,8 +60,9 @@ TObservation Observe(std::string const& file, std::string const& mofFile, TPlugI
   observation.fExports = ExportedSymbols(observation.fFile.fFile);
   for (auto other = files.begin() + 1; other != files.end(); ++other)
     if (other->IsLoaded()) observation.fInstalled.push_back(other->fName);
-  if (observation.fFile.IsLoaded()) {
-    observation.fFirst = Try(observation.fFile, arguments);
+  if (observation.fFile.IsLoaded()) observation.fFirst = Try(observation.fFile, arguments);
+  if (observation.WhyNoContent().empty()) {
+    WaitForNextSecond();
     observation.fSecond = Try(observation.fFile, arguments);
   }
   FindSchema(mofFile, observation);

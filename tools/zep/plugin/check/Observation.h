@@ -23,7 +23,8 @@ struct TObservation {
   TPlugInFile fFile;
   std::optional<std::vector<std::string>> fExports;  // none if they cannot be read
   std::vector<std::string> fInstalled;               // the names of the other plug-ins that are installed
-  TTrial fFirst, fSecond;                            // empty if the file is not loaded
+  TTrial fFirst;                                     // empty if the file is not loaded
+  TTrial fSecond;                                    // empty if no namespace was filled in the first
   std::string fSchemaFile;                           // empty without a schema
   std::string fWhyNoSchema;                          // in that case
   std::optional<TNamespaceView> fSchema;
@@ -33,9 +34,9 @@ struct TObservation {
   std::string WhyNoContent() const;  // no namespace
 };
 
-// Loads the plug-in in two processes, one after the other, and reads the schema: `mofFile`, or if that is empty, the one that
-// SchemaFile finds. Throws std::runtime_error for a file that does not exist, and TMofError for a wrong schema. Blocks like
-// LoadPlugInsApart.
+// Loads the plug-in in two processes, one after the other and in different seconds of the clock, and reads the schema: `mofFile`,
+// or if that is empty, the one that SchemaFile finds. Throws std::runtime_error for a file that does not exist, and TMofError for
+// a wrong schema. Blocks like LoadPlugInsApart.
 TObservation Observe(std::string const& file, std::string const& mofFile, TPlugInArguments const& arguments);
 
 }  // namespace NQRVZEP20::zep

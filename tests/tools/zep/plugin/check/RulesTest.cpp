@@ -68,60 +68,80 @@ protected:
     return found;
   }
 
-  TInstallation fZep;
-};
-
-TEST_F(CheckTest, EachPlantedFaultIsFoundByItsRuleWithItsPlace) {
-  struct TRow {
+  struct TFault {
     std::string fName, fRule, fPlace, fText;
     TNames fOptions = {};
   };
-  TNames const withSchema = {"--mof", "things.mof"};
-  std::vector<TRow> rows = {
-      {"LoadThrows", "static-construction", "static construction", "no disk today"},
-      {"RegistersNothing", "registration", "libRegistersNothing.nsp.so", "it registers no provider"},
-      {"RegistersTwice", "registration", "provider RegistersTwice", "registers this name twice"},
-      {"RegistersHost", "registration", "provider Host", "it registers the name of another plug-in"},
-      {"RegistersAnother", "registration", "provider Another", "no provider has the name of the plug-in, RegistersAnother"},
-      {"Throws", "fill", "provider Throws", "no disk"},
-      {"Crashes", "fill", "provider Crashes", "SIGSEGV"},
-      {"Exits", "fill", "provider Exits", "it exited with status 3"},
-      {"Hangs", "time-and-memory", "provider Hangs, fill", "time limit of 1 s", {"--plugin-timeout", "1"}},
-      {"KeyDiffers", "fill-differs", "root/faulty:X_Thing.Id=", "it is missing the second time"},
-      {"ClassDiffers", "fill-differs", "class X_Of", "it is missing the second time"},
-      {"TypeDiffers", "fill-differs", "X_Thing.Text", "its type is string, and uint16 the second time"},
-      {"FailsLater", "fill-differs", "provider FailsLater", "it failed the second time: no more"},
-      {"HasNoKey", "keys", "X_Plain", "instances without any key value, whose path is that of the class: 1"},
-      {"HasNullKey", "keys", "root/faulty:X_Thing.Id=\"1\".Other", "the key is NULL"},
-      {"HasBytes", "text", "root/faulty:X_Thing.Id=\"1\".Text", "\"a\\xff\" has bytes"},
-      {"HasZero", "text", "root/faulty:X_Thing.Id=\"a\\x00b\".Id", "\"a\\x00b\" has bytes"},
-      {"HasBytesInAList", "text", "root/faulty:X_Thing.Id=\"1\".Text[1]", "\"\\xff\" has bytes"},
-      {"IsInfinite", "text", "root/faulty:X_Thing.Id=\"1\".Text", "inf is not a number in JSON"},
-      {"HasWrongType", "schema", "CIM_Thing.State", "its type is string, in the schema uint16", withSchema},
-      {"HasWrongKey", "schema", "CIM_Thing.State", "it is a key, but not in the schema", withSchema},
-      {"HasWrongSuperClass", "schema", "CIM_Thing", "in the schema, CIM_Other is not a superclass of it", withSchema},
-      {"IsAbstract", "schema", "CIM_Element", "it is abstract in the schema, but has instances", withSchema},
-      {"LeavesDescriptor", "left-behind", "(/dev/null)", "it is still open after the fill"},
-      {"LeavesProcess", "left-behind", "(zep)", "it is left after the fill"},
-      {"LeavesOrphan", "left-behind", "(zep)", "it is left after the fill"},
-      {"Prints", "output", "standard output or standard error", "it prints \"found 3 disks\" and more lines"},
-  };
-  if (!kIsSanitized)  // which needs more memory than any limit allows
-    rows.push_back({"FillsMemory",
-                    "time-and-memory",
-                    "provider FillsMemory, fill",
-                    "the memory limit is 64 MiB",
-                    {"--plugin-memory", "64"}});
-  for (TRow const& row : rows) {
-    SCOPED_TRACE(row.fName);
-    nlohmann::json const document = DocumentOf(Faulty("lib" + row.fName + ".nsp.so"), row.fOptions);
+
+  // The plug-in of that name has a finding of that rule, with the place and the text, and no other rule finds anything.
+  void ExpectFound(TFault const& fault) {
+    SCOPED_TRACE(fault.fName);
+    nlohmann::json const document = DocumentOf(Faulty("lib" + fault.fName + ".nsp.so"), fault.fOptions);
     EXPECT_EQ(document["exitStatus"], 1);
-    EXPECT_EQ(FoundIn(document), TNames{row.fRule}) << document.dump(2);
-    nlohmann::json const rule = RuleOf(document, row.fRule);
+    EXPECT_EQ(FoundIn(document), TNames{fault.fRule}) << document.dump(2);
+    nlohmann::json const rule = RuleOf(document, fault.fRule);
     ASSERT_FALSE(rule["findings"].empty());
-    EXPECT_THAT(rule["findings"][0]["place"], HasSubstr(row.fPlace));
-    EXPECT_THAT(rule["findings"][0]["text"], HasSubstr(row.fText));
+    EXPECT_THAT(rule["findings"][0]["place"], HasSubstr(fault.fPlace));
+    EXPECT_THAT(rule["findings"][0]["text"], HasSubstr(fault.fText));
   }
+
+  TInstallation fZep;
+};
+
+TEST_F(CheckTest, AFaultOfTheLoadOrTheFillIsFoundByItsRule) {
+  for (TFault const& fault : std::vector<TFault>{
+           {"LoadThrows", "static-construction", "static construction", "no disk today"},
+           {"RegistersNothing", "registration", "libRegistersNothing.nsp.so", "it registers no provider"},
+           {"RegistersTwice", "registration", "provider RegistersTwice", "registers this name twice"},
+           {"RegistersHost", "registration", "provider Host", "it registers the name of another plug-in"},
+           {"RegistersAnother", "registration", "provider Another", "no provider has the name of the plug-in, RegistersAnother"},
+           {"Throws", "fill", "provider Throws", "no disk"},
+           {"Crashes", "fill", "provider Crashes", "SIGSEGV"},
+           {"Exits", "fill", "provider Exits", "it exited with status 3"},
+           {"Hangs", "time-and-memory", "provider Hangs, fill", "time limit of 1 s", {"--plugin-timeout", "1"}},
+       })
+    ExpectFound(fault);
+  if (kIsSanitized) return;  // which needs more memory than any limit allows
+  ExpectFound(
+      {"FillsMemory", "time-and-memory", "provider FillsMemory, fill", "the memory limit is 64 MiB", {"--plugin-memory", "64"}});
+}
+
+TEST_F(CheckTest, AFillThatDiffersIsFound) {
+  for (TFault const& fault : std::vector<TFault>{
+           {"KeyDiffers", "fill-differs", "root/faulty:X_Thing.Id=", "it is missing the second time"},
+           {"TimeIsKey", "fill-differs", "root/faulty:X_Thing.Id=", "it is missing the second time"},
+           {"ClassDiffers", "fill-differs", "class X_Of", "it is missing the second time"},
+           {"TypeDiffers", "fill-differs", "X_Thing.Text", "its type is string, and uint16 the second time"},
+           {"FailsLater", "fill-differs", "provider FailsLater", "it failed the second time: no more"},
+       })
+    ExpectFound(fault);
+}
+
+TEST_F(CheckTest, ATraceThatIsLeftIsFoundByItsRule) {
+  for (TFault const& fault : std::vector<TFault>{
+           {"LeavesDescriptor", "left-behind", "(/dev/null)", "it is still open after the fill"},
+           {"LeavesProcess", "left-behind", "(zep)", "it is left after the fill"},
+           {"LeavesOrphan", "left-behind", "(zep)", "it is left after the fill"},
+           {"Prints", "output", "standard output or standard error", "it prints \"found 3 disks\" and more lines"},
+       })
+    ExpectFound(fault);
+}
+
+TEST_F(CheckTest, AFaultOfTheContentsIsFoundByItsRule) {
+  TNames const withSchema = {"--mof", "things.mof"};
+  for (TFault const& fault : std::vector<TFault>{
+           {"HasNoKey", "keys", "X_Plain", "instances without any key value, whose path is that of the class: 1"},
+           {"HasNullKey", "keys", "root/faulty:X_Thing.Id=\"1\".Other", "the key is NULL"},
+           {"HasBytes", "text", "root/faulty:X_Thing.Id=\"1\".Text", "\"a\\xff\" has bytes"},
+           {"HasZero", "text", "root/faulty:X_Thing.Id=\"a\\x00b\".Id", "\"a\\x00b\" has bytes"},
+           {"HasBytesInAList", "text", "root/faulty:X_Thing.Id=\"1\".Text[1]", "\"\\xff\" has bytes"},
+           {"IsInfinite", "text", "root/faulty:X_Thing.Id=\"1\".Text", "inf is not a number in JSON"},
+           {"HasWrongType", "schema", "CIM_Thing.State", "its type is string, in the schema uint16", withSchema},
+           {"HasWrongKey", "schema", "CIM_Thing.State", "it is a key, but not in the schema", withSchema},
+           {"HasWrongSuperClass", "schema", "CIM_Thing", "in the schema, CIM_Other is not a superclass of it", withSchema},
+           {"IsAbstract", "schema", "CIM_Element", "it is abstract in the schema, but has instances", withSchema},
+       })
+    ExpectFound(fault);
 }
 
 TEST_F(CheckTest, AFileThatHostsCannotFindIsFound) {
@@ -135,7 +155,8 @@ TEST_F(CheckTest, AnUndefinedSymbolIsFoundAndTheOtherRulesAreNotChecked) {
   nlohmann::json const document = DocumentOf(Faulty("libLacks.nsp.so", LACKS_SYMBOL));
   EXPECT_EQ(FoundIn(document), (TNames{"undefined-symbols", "exports"})) << document.dump(2);
   EXPECT_EQ(RuleOf(document, "undefined-symbols")["findings"][0]["place"], "SymbolThatIsMissing(int)");
-  EXPECT_THAT(RuleOf(document, "exports")["findings"][0]["text"], HasSubstr("may replace those of other plug-ins: 1, such as UseIt"));
+  EXPECT_THAT(RuleOf(document, "exports")["findings"][0]["text"],
+              HasSubstr("may replace those of other plug-ins: 1, such as UseIt"));
   for (char const* id : {"static-construction", "registration", "fill", "fill-differs", "keys", "text", "schema"})
     EXPECT_EQ(RuleOf(document, id)["whyNotChecked"], "the plug-in could not be loaded") << id;
 }
