@@ -40,6 +40,7 @@ TRoom const kRooms[] = {
     {"providers/reasons", {"include", "providers/memory"}},
     {"providers/mof", {"include", "core", "providers/memory"}},
     {"providers/host", {"include", "core", "loaders", "providers/memory", "providers/reasons", "platform/include"}},
+    {"providers/storage", {"include", "providers/memory", "providers/reasons"}},
     {"collect", {"include", "core", "providers/memory", "providers/mof", "providers/reasons"}},
     {"tools/zep",
      {"include", "core", "loaders", "os", "proxy", "platform/include", "providers/memory", "providers/mof", "providers/reasons",

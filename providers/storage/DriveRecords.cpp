@@ -1,0 +1,189 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "DriveRecords.h"
+
+#include "ValueNames.h"
+
+#include <algorithm>
+#include <iterator>
+#include <string>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+using TText = TFinding<std::string>;
+using TTexts = TFinding<std::vector<std::string>>;
+using TCode = TFinding<unsigned short>;
+using TCodes = TFinding<std::vector<unsigned short>>;
+
+constexpr char const* kSource = "sysfs, udev";
+
+// Values of the schema (ValueNames.h).
+constexpr unsigned short kSequentialAccess = 2, kRandomAccess = 3, kWriting = 4, kRemovableMedia = 7;
+constexpr unsigned short kHardDisk = 2, kSolidState = 3;
+constexpr unsigned short kOtherFormFactor = 1, kFormFactor525 = 3;
+constexpr unsigned short kOther = 1, kATA = 3, kSATA = 4, kSAS = 5, kFC = 6;
+constexpr unsigned short kStorageMediaPackage = 15;
+constexpr unsigned short kFirmwareClass = 10;
+
+struct TStateStatus {
+  char const* fState;
+  unsigned short fStatus;  // of the property OperationalStatus
+};
+constexpr TStateStatus kStates[] = {
+    {"running", 2},          {"live", 2},     {"quiesce", 10},  {"blocked", 10},    {"created-blocked", 10},
+    {"created", 8},          {"new", 8},      {"resetting", 8}, {"connecting", 12}, {"deleting", 9},
+    {"cancel", 9},           {"deleted", 10}, {"dead", 6},      {"offline", 6},     {"transport-offline", 13},
+    {"deleting (no IO)", 9},
+};
+
+TCodes StatusFrom(std::string const& state) {
+  auto const found = std::find_if(std::begin(kStates), std::end(kStates), [&](auto const& row) { return row.fState == state; });
+  if (found == std::end(kStates)) return TMissing{kMissingUnexpected, "the kernel reports the state \"" + state + "\""};
+  return std::vector<unsigned short>{found->fStatus};
+}
+
+// The identifiers of a drive with their meanings, for two parallel arrays.
+struct TIdentifiers {
+  std::vector<std::string> fValues, fMeanings;
+
+  void Add(TText const& value, std::string const& meaning) {
+    if (!value) return;
+    fValues.push_back(*value);
+    fMeanings.push_back(meaning);
+  }
+};
+
+TIdentifiers IdentifiersOf(TDisk const& disk) {
+  TIdentifiers identifiers;
+  for (TDesignator const& designator : disk.fDesignators) identifiers.Add(designator.fText, designator.fFormat);
+  identifiers.Add(disk.fSerialNumber, "Serial number");
+  identifiers.Add(disk.fAttachment.ScsiAddress(), "SCSI address");
+  return identifiers;
+}
+
+TTexts TextsFrom(std::vector<std::string> const& texts) {
+  if (texts.empty()) return TMissing{kMissingNotGiven, "neither the drive nor the kernel reports an identifier"};
+  return texts;
+}
+
+TCodes CapabilitiesOf(TMachineFiles const& files, TBlockDevice const& drive) {
+  std::vector<unsigned short> codes{drive.fKind == TBlockDevice::kTape ? kSequentialAccess : kRandomAccess};
+  auto const readOnly = files.Number<int>(drive.File("ro")), removable = files.Number<int>(drive.File("removable"));
+  if (drive.fKind == TBlockDevice::kTape || (readOnly && *readOnly == 0)) codes.push_back(kWriting);
+  if (drive.fKind == TBlockDevice::kTape || (removable && *removable != 0)) codes.push_back(kRemovableMedia);
+  return codes;
+}
+
+// The schema counts in units of 1000 bytes.
+TFinding<unsigned long> MediaSizeOf(TMachineFiles const& files, TBlockDevice const& drive) {
+  return SizeOf(files, drive).Then([](unsigned long bytes) { return bytes / 1000; });
+}
+
+// ---- Disks ----
+
+bool IsVirtual(TDisk const& disk) {
+  return disk.fAttachment.fTransport && (*disk.fAttachment.fTransport == "virtio" || *disk.fAttachment.fTransport == "xen");
+}
+
+TCode DiskTypeOf(TMachineFiles const& files, TDisk const& disk) {
+  if (IsVirtual(disk)) return TMissing{kMissingNotApplicable, "the kernel does not know the medium behind a virtual disk"};
+  if (disk.fRotationsPerMinute) return *disk.fRotationsPerMinute == 0 ? kSolidState : kHardDisk;
+  return files.Number<int>(disk.fDevice.File("queue/rotational")).Then([](int isRotating) {
+    return isRotating != 0 ? kHardDisk : kSolidState;
+  });
+}
+
+TFinding<unsigned int> RotationsOf(TDisk const& disk) {
+  return disk.fRotationsPerMinute.Then([](unsigned rotations) -> TFinding<unsigned int> {
+    if (rotations == 0) return TMissing{kMissingNotApplicable, "this disk does not rotate"};
+    return rotations;
+  });
+}
+
+// The schema numbers the same sizes from 3 on.
+unsigned short FormFactorFrom(unsigned code) {
+  constexpr unsigned kLessThan18 = 5;
+  return code == kLessThan18 ? kOtherFormFactor : static_cast<unsigned short>(code - 1 + kFormFactor525);
+}
+
+struct TInterconnect {
+  char const* fTransport;
+  unsigned short fType;
+  char const* fOtherName;
+};
+constexpr TInterconnect kInterconnects[] = {
+    {"sata", kSATA, nullptr},   {"ata", kATA, nullptr},       {"sas", kSAS, nullptr},
+    {"fc", kFC, nullptr},       {"nvme", kOther, "NVMe"},     {"usb", kOther, "USB"},
+    {"iscsi", kOther, "iSCSI"}, {"virtio", kOther, "virtio"}, {"spi", kOther, "SCSI parallel interface"},
+    {"mmc", kOther, "MMC"},     {"sd", kOther, "SD"},         {"xen", kOther, "Xen"},
+    {"ufs", kOther, "UFS"},
+};
+
+TInterconnect const& InterconnectOf(std::string const& transport) {
+  auto const isWanted = [&](TInterconnect const& row) { return row.fTransport == transport; };
+  return *std::find_if(std::begin(kInterconnects), std::end(kInterconnects) - 1, isWanted);
+}
+
+TText OtherInterconnectOf(std::string const& transport) {
+  TInterconnect const& interconnect = InterconnectOf(transport);
+  if (interconnect.fOtherName == nullptr) return TMissing{kMissingNotApplicable, "InterconnectType names the interconnect"};
+  return std::string(interconnect.fOtherName);
+}
+
+}  // namespace
+
+TRecord DriveRecord(char const* className, TMachineFiles const& files, TDisk const& disk, TComputerSystem const& system) {
+  TIdentifiers const identifiers = IdentifiersOf(disk);
+  TBlockDevice const& device = disk.fDevice;
+  TRecord record(className, kSource);
+  system.AddDeviceKeys(record, device.fName);
+  record.Add("Name", TText(device.Node()));
+  record.Add("ElementName", disk.fModel);
+  record.Add("OtherIdentifyingInfo", TextsFrom(identifiers.fValues));
+  record.Add("IdentifyingDescriptions", TextsFrom(identifiers.fMeanings));
+  record.Add("OperationalStatus", disk.fState.Then(StatusFrom)).Names(kOperationalStatusNames);
+  record.Add("StatusDescriptions", disk.fState.Then([](auto const& state) { return std::vector<std::string>{state}; }));
+  record.Add("Capabilities", CapabilitiesOf(files, device)).Names(kCapabilitiesNames);
+  record.Add("MaxMediaSize", MediaSizeOf(files, device));
+  record.Add("DefaultBlockSize", files.Number<unsigned long>(device.File("queue/logical_block_size"))).Unit("byte");
+  return record;
+}
+
+TRecord DiskDriveRecord(TMachineFiles const& files, TDisk const& disk, TComputerSystem const& system) {
+  TText const& transport = disk.fAttachment.fTransport;
+  TRecord record = DriveRecord("CIM_DiskDrive", files, disk, system);
+  record.Add("DiskType", DiskTypeOf(files, disk)).Names(kDiskTypeNames);
+  record.Add("RPM", RotationsOf(disk)).Unit("revolution / minute");
+  record.Add("FormFactor", disk.fFormFactor.Then(FormFactorFrom)).Names(kFormFactorNames);
+  record.Add("InterconnectType", transport.Then([](auto const& name) { return InterconnectOf(name).fType; }))
+      .Names(kInterconnectTypeNames);
+  record.Add("OtherInterconnectType", transport.Then(OtherInterconnectOf));
+  record.Add("InterconnectSpeed", disk.fAttachment.fSpeed);
+  return record;
+}
+
+TRecord PackageRecord(TDisk const& disk) {
+  TRecord record("CIM_PhysicalPackage", kSource);
+  record.AddKey("CreationClassName", "CIM_PhysicalPackage");
+  record.AddKey("Tag", "disk:" + disk.fDevice.fName);
+  record.Add("ElementName", disk.fModel);
+  record.Add("Manufacturer", disk.fVendor);
+  record.Add("Model", disk.fModel);
+  record.Add("SerialNumber", disk.fSerialNumber);
+  record.Add("PackageType", TCode(kStorageMediaPackage)).Names(kPackageTypeNames);
+  return record;
+}
+
+TRecord FirmwareRecord(TDisk const& disk) {
+  TRecord record("CIM_SoftwareIdentity", kSource);
+  record.AddKey("InstanceID", "ZEP:firmware:" + disk.fDevice.fName);
+  record.Add("ElementName", disk.fModel.Then([](std::string const& model) { return "Firmware of " + model; }));
+  record.Add("Manufacturer", disk.fVendor);
+  record.Add("VersionString", disk.fFirmware);
+  record.Add("Classifications", TCodes(std::vector<unsigned short>{kFirmwareClass})).Names(kClassificationsNames);
+  return record;
+}
+
+}  // namespace NQRVZEP20
