@@ -12,8 +12,11 @@ class TRecordedMachine {
 public:
   explicit TRecordedMachine(std::string const& name) {
     std::string const archive = TestDataPath("machines/" + name + ".tar.gz");
-    fIsThere = std::system(("tar -C '" + fDir.Path() + "' -xzf '" + archive + "'").c_str()) == 0;
-    EXPECT_TRUE(fIsThere) << archive << " cannot be unpacked";
+    int const status = std::system(("tar -C '" + fDir.Path() + "' -xzf '" + archive + "'").c_str());
+    EXPECT_EQ(status, 0) << archive << " cannot be unpacked";
+    std::string const answers = TestDataPath("machines/" + name);
+    if (std::filesystem::exists(answers))
+      std::filesystem::copy(answers, fDir.Path(), std::filesystem::copy_options::recursive);
   }
 
   // A directory for ZEP_ROOT.
@@ -21,7 +24,6 @@ public:
 
 private:
   TTempDir fDir;
-  bool fIsThere = false;
 };
 
 }  // namespace NQRVZEP20

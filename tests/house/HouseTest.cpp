@@ -41,6 +41,7 @@ TRoom const kRooms[] = {
     {"providers/mof", {"include", "core", "providers/memory"}},
     {"providers/host", {"include", "core", "loaders", "providers/memory", "providers/reasons", "platform/include"}},
     {"providers/storage", {"include", "providers/memory", "providers/reasons"}},
+    {"providers/devices", {"include", "providers/memory", "providers/reasons"}},
     {"collect", {"include", "core", "providers/memory", "providers/mof", "providers/reasons"}},
     {"tools/zep",
      {"include", "core", "loaders", "os", "proxy", "platform/include", "providers/memory", "providers/mof", "providers/reasons",

@@ -28,7 +28,9 @@ public:
 private:
   using TDecls = std::map<std::string, boost::shared_ptr<ICIMPropertyDecl const>>;
 
-  static bool IsOfSchema(std::string const& className) { return className.rfind("CIM_", 0) == 0; }
+  static bool IsOfSchema(std::string const& className) {
+    return className.rfind("CIM_", 0) == 0 || className.rfind("ZEP_", 0) == 0;
+  }
 
   static std::string TextOf(ICIMPropertyDecl const& property, char const* qualifier) {
     auto const found = property.GetQualifier(qualifier, kNone);

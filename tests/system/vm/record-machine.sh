@@ -3,7 +3,9 @@
 #
 # Records the files that describe a virtual server, for tests that replay them below ZEP_ROOT.
 #
-#   record-machine.sh MACHINE BUILD     writes tests/data/machines/MACHINE.tar.gz
+#   record-machine.sh MACHINE BUILD     writes tests/data/machines/MACHINE.tar.gz and tests/data/machines/MACHINE/
+#
+# The archive has the files, and the folder the answers to the queries of the provider plug-ins.
 #
 # MACHINE is a script in the folder machines/ beside this one: it sets up the disks and ports of the virtual machine below. BUILD
 # is a build tree with zep and the provider plug-ins, which record the answers to their queries (ZEP_RECORD_ANSWERS).
@@ -11,9 +13,9 @@
 # The virtual machine has two sockets with two cores each, two NUMA nodes, a PCI Express switch with an NVMe disk, a SATA, a SCSI, a virtio,
 # a USB and an SD disk, a CD-ROM drive, ports of two drivers, a TPM, and an IPMI KCS interface.
 #
-# Needs: what run-in-vm.sh needs, and the packages udev, mdadm, lvm2, iproute2, fdisk, e2fsprogs, smartmontools, swtpm.
+# Needs: what run-in-vm.sh needs, and the packages udev, mdadm, lvm2, iproute2, fdisk, e2fsprogs, smartmontools, pci.ids, swtpm.
 set -eu
-[ $# = 2 ] || { sed -n '3,16s/^# \{0,1\}//p' "$0" >&2; exit 2; }
+[ $# = 2 ] || { sed -n '3,18s/^# \{0,1\}//p' "$0" >&2; exit 2; }
 here=$(cd "$(dirname "$0")" && pwd)
 machine=$1 build=$(cd "$2" && pwd)
 work=$(mktemp -d "${TMPDIR:-/tmp}/zep-record.XXXXXX")
@@ -52,11 +54,17 @@ for program in mdadm lvm ip sfdisk mkfs.ext4 mkfs.vfat smartctl udevadm dmsetup;
 done
 status=0
 "$here/run-in-vm.sh" --hw --timeout 180 "$@" \
-  --file /lib/systemd/systemd-udevd --file /lib/udev --file /etc/os-release \
+  --file /lib/systemd/systemd-udevd --file /lib/udev --file /etc/os-release --file /usr/share/misc/pci.ids \
   --file "$build/bin/zep" --file "$build/lib" --file "$here/machines" --file "$here/record-files.sh" \
   --out "$work/out" --qemu "$cpus $switch $disks $ports $tpm_device" \
   sh -c "sh $here/machines/$machine.sh && sh $here/record-files.sh $build/bin/zep" || status=$?
 [ -e "$work/out/tree" ] || { echo "record-machine.sh: nothing was recorded (status $status)" >&2; exit 1; }
-archive=$(cd "$here/../../.." && pwd)/tests/data/machines/$machine.tar.gz
+machines=$(cd "$here/../../.." && pwd)/tests/data/machines
+archive=$machines/$machine.tar.gz
+if [ -e "$work/out/tree/zep-answers" ]; then
+  rm -rf "${machines:?}/$machine"
+  mkdir "$machines/$machine"
+  mv "$work/out/tree/zep-answers" "$machines/$machine/"
+fi
 tar -C "$work/out/tree" --sort=name --mtime=@0 --owner=0 --group=0 --numeric-owner --mode=u+rw,go+r -cf - . | gzip -9n > "$archive"
 ls -l "$archive"

@@ -1,0 +1,256 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "PciRecords.h"
+
+#include "PciLink.h"
+#include "ValueNames.h"
+
+#include <algorithm>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+using TText = TFinding<std::string>;
+
+std::string const kDevices = "/sys/bus/pci/devices/";
+std::string const kSlots = "/sys/bus/pci/slots/";
+constexpr std::uint32_t kClassOfBridges = 0x06;
+constexpr unsigned kHostBridge = 0x00, kPciBridge = 0x04;  // subclasses
+
+TMissing Unread() { return {kMissingNotDescribed, "not read"}; }
+
+// A function's numbers and files, or nothing for a record that only declares its class.
+class TPciFiles {
+public:
+  TPciFiles() : fFiles(nullptr) {}
+  TPciFiles(TMachineFiles const& files, std::string const& name) : fFiles(&files), fDirectory(kDevices + name + "/") {}
+
+  template <class T>
+  TFinding<T> Number(char const* file) const {
+    if (fFiles == nullptr) return Unread();
+    return fFiles->Number<T>(fDirectory + file);
+  }
+  TText Line(char const* file) const {
+    if (fFiles == nullptr) return Unread();
+    return fFiles->Line(fDirectory + file);
+  }
+  TText RealName(char const* file) const {
+    if (fFiles == nullptr) return Unread();
+    return fFiles->RealName(fDirectory + file);
+  }
+  bool Has(char const* file) const { return fFiles != nullptr && fFiles->Exists(fDirectory + file); }
+
+private:
+  TMachineFiles const* fFiles;
+  std::string fDirectory;
+};
+
+TFinding<TPciNumbers> NumbersOf(TPciFiles const& function) {
+  auto const cls = function.Number<std::uint32_t>("class");
+  auto const vendor = function.Number<std::uint16_t>("vendor"), device = function.Number<std::uint16_t>("device");
+  auto const subVendor = function.Number<std::uint16_t>("subsystem_vendor"),
+             subDevice = function.Number<std::uint16_t>("subsystem_device");
+  if (!cls) return cls.Why();
+  if (!vendor) return vendor.Why();
+  if (!device) return device.Why();
+  return TPciNumbers{*vendor, *device, subVendor ? *subVendor : std::uint16_t(0), subDevice ? *subDevice : std::uint16_t(0),
+                     *cls};
+}
+
+// The vendor and the device: "Intel Corporation 82574L Gigabit Network Connection".
+TText FullNameOf(TPciNames const& names) {
+  if (!names.fDevice) return names.fVendor;
+  return names.fVendor.Then([&](std::string const& vendor) { return vendor + " " + *names.fDevice; });
+}
+
+// A subsystem whose vendor is 0 is not programmed.
+TFinding<std::uint16_t> SubsystemNumber(TFinding<TPciNumbers> const& numbers, std::uint16_t TPciNumbers::*number) {
+  return numbers.Then([number](TPciNumbers const& n) -> TFinding<std::uint16_t> {
+    if (n.fSubsystemVendor == 0) return TMissing{kMissingNotGiven, "the device has no subsystem"};
+    return n.*number;
+  });
+}
+
+// What identifies the function besides its names: each value with its description.
+struct TIdentifiers {
+  std::vector<std::string> fValues;
+  std::vector<std::string> fDescriptions;
+
+  void Add(char const* description, TText const& value) {
+    if (!value) return;
+    fValues.push_back(*value);
+    fDescriptions.emplace_back(description);
+  }
+};
+
+TIdentifiers IdentifiersOf(TPciFiles const& function, TPciNames const& names) {
+  TIdentifiers identifiers;
+  identifiers.Add("Vendor", names.fVendor);
+  identifiers.Add("Subsystem", names.fSubsystem);
+  identifiers.Add("Driver", function.RealName("driver"));
+  identifiers.Add("Kernel module", function.RealName("driver/module"));
+  identifiers.Add("Firmware label", function.Line("label"));
+  identifiers.Add("NUMA node", function.Number<int>("numa_node").Then([](int node) -> TText {
+    if (node < 0) return TMissing{kMissingNotGiven, "the kernel reports no NUMA node"};
+    return std::to_string(node);
+  }));
+  return identifiers;
+}
+
+TRecord FunctionRecord(char const* className, TComputerSystem const& system, std::string const& name, TPciAddress const& address,
+                       TPciFiles const& function, TPciNames const& names) {
+  auto const numbers = NumbersOf(function);
+  TIdentifiers const identifiers = IdentifiersOf(function, names);
+  TRecord record(className, "pci.ids");
+  system.AddDeviceKeys(record, name);
+  record.Add("Name", FullNameOf(names));
+  record.Add("ElementName", names.fDevice);
+  record.Add("Caption", names.fClass);
+  record.SetSource("sysfs");
+  record.Add("ClassCode", numbers.Then([](TPciNumbers const& n) { return std::uint8_t(n.fClass >> 16); })).Names(kClassCodeNames);
+  record.Add("VendorID", numbers.Then([](TPciNumbers const& n) { return n.fVendor; }));
+  record.Add("PCIDeviceID", numbers.Then([](TPciNumbers const& n) { return n.fDevice; }));
+  record.Add("SubsystemVendorID", SubsystemNumber(numbers, &TPciNumbers::fSubsystemVendor));
+  record.Add("SubsystemID", SubsystemNumber(numbers, &TPciNumbers::fSubsystem));
+  record.Add("RevisionID", function.Number<std::uint8_t>("revision"));
+  record.Add("BusNumber", TFinding<std::uint8_t>(address.fBus));
+  record.Add("DeviceNumber", TFinding<std::uint8_t>(address.fDevice));
+  record.Add("FunctionNumber", TFinding<std::uint8_t>(address.fFunction));
+  record.Add("IdentifyingDescriptions", TFinding<std::vector<std::string>>(identifiers.fDescriptions));
+  record.Add("OtherIdentifyingInfo", TFinding<std::vector<std::string>>(identifiers.fValues));
+  return record;
+}
+
+TFinding<std::uint16_t> BridgeTypeOf(TPciFiles const& function) {
+  return function.Number<std::uint32_t>("class").Then([&](std::uint32_t cls) {
+    constexpr std::uint16_t pciExpress = 10, other = 128, lastOfPci = 0x08;
+    unsigned const subclass = (cls >> 8) & 0xff;
+    if (subclass == kPciBridge && function.Has("current_link_speed")) return pciExpress;
+    // CIM numbers the other bridges as the PCI standard does, up to RACEway.
+    return subclass <= lastOfPci ? static_cast<std::uint16_t>(subclass) : other;
+  });
+}
+
+// Only a bridge to another PCI bus has bus numbers.
+TFinding<std::uint8_t> BusNumber(TPciFiles const& function, char const* file) {
+  if (!function.Has(file)) return TMissing{kMissingNotApplicable, "the bridge does not lead to a PCI bus"};
+  return function.Number<std::uint8_t>(file);
+}
+
+TRecord BridgeRecord(TComputerSystem const& system, std::string const& name, TPciAddress const& address,
+                     TPciFiles const& function, TPciNames const& names) {
+  TRecord record = FunctionRecord("CIM_PCIBridge", system, name, address, function, names);
+  record.Add("BridgeType", BridgeTypeOf(function)).Names(kBridgeTypeNames);
+  record.Add("PrimaryBusNumber", TFinding<std::uint8_t>(address.fBus));
+  record.Add("SecondayBusNumber", BusNumber(function, "secondary_bus_number"));  // the spelling of the schema
+  record.Add("SubordinateBusNumber", BusNumber(function, "subordinate_bus_number"));
+  return record;
+}
+
+TFinding<float> RateOf(TPciFiles const& function, char const* file) { return function.Line(file).Then(PciTransferRateFrom); }
+
+TFinding<std::uint16_t> WidthOf(TPciFiles const& function, char const* file) {
+  return function.Number<std::uint16_t>(file).Then(PciWidthFrom);
+}
+
+TFinding<std::uint64_t> SpeedOf(TFinding<float> const& rate, TFinding<std::uint16_t> const& width) {
+  return rate.Then(
+      [&](float transfers) { return width.Then([&](std::uint16_t lanes) { return PciSpeedFrom(transfers, lanes); }); });
+}
+
+TFinding<std::uint64_t> CurrentSpeedOf(TPciFiles const& function) {
+  return SpeedOf(RateOf(function, "current_link_speed"), WidthOf(function, "current_link_width"));
+}
+
+TRecord LinkRecord(TComputerSystem const& system, std::string const& name, TPciFiles const& function) {
+  constexpr unsigned short pciExpress = 152;
+  auto const maxRate = RateOf(function, "max_link_speed");
+  auto const maxWidth = WidthOf(function, "max_link_width");
+
+  TRecord record("ZEP_PCIExpressLink", "sysfs", "CIM_PCIPort");
+  system.AddDeviceKeys(record, name);
+  record.AddOwn("PortType", pciExpress).Names(kPortTypeNames);
+  record.Add("TransferRate", RateOf(function, "current_link_speed"));
+  record.Add("MaxTransferRate", maxRate);
+  record.Add("Width", WidthOf(function, "current_link_width"));
+  record.Add("MaxWidth", maxWidth);
+  record.Add("Speed", CurrentSpeedOf(function)).Unit("bit / second");
+  record.Add("MaxSpeed", SpeedOf(maxRate, maxWidth)).Unit("bit / second");
+  return record;
+}
+
+// The name of the bridge above: the directory of a function lies in that of its bridge.
+std::string BridgeAbove(TMachineFiles const& files, std::string const& name) {
+  auto const path = files.RealPath(kDevices + name);
+  if (!path) return "";
+  std::string const above = path->substr(0, path->rfind('/'));
+  std::string const bridge = above.substr(above.rfind('/') + 1);
+  return PciAddressFrom(bridge) ? bridge : "";
+}
+
+bool IsBridge(TPciFiles const& function) {
+  auto const cls = function.Number<std::uint32_t>("class");
+  return cls && *cls >> 16 == kClassOfBridges;
+}
+
+TPciNames NoNames() { return {Unread(), Unread(), Unread(), Unread()}; }
+
+}  // namespace
+
+std::vector<TPciFunction> PciFunctions(TMachineFiles const& files, TComputerSystem const& system) {
+  TPciIds ids;
+  std::vector<TPciFunction> functions;
+  for (std::string const& name : files.Names(kDevices)) {
+    auto const address = PciAddressFrom(name);
+    TPciFiles const function(files, name);
+    auto const numbers = NumbersOf(function);
+    if (!address || !numbers) continue;
+    TPciNames const names = ids.NamesOf(*numbers, files);
+    bool const isBridge = IsBridge(function);
+    functions.push_back({name, *address, BridgeAbove(files, name), isBridge,
+                         isBridge ? BridgeRecord(system, name, *address, function, names)
+                                  : FunctionRecord("CIM_PCIDevice", system, name, *address, function, names),
+                         std::nullopt, std::nullopt});
+    if (!function.Has("current_link_speed")) continue;
+    functions.back().fLink = LinkRecord(system, name, function);
+    functions.back().fLinkSpeed = CurrentSpeedOf(function);
+  }
+  std::sort(functions.begin(), functions.end(), [](TPciFunction const& a, TPciFunction const& b) { return a.fName < b.fName; });
+  return functions;
+}
+
+TRecord PciDeviceShape(TComputerSystem const& system) {
+  return FunctionRecord("CIM_PCIDevice", system, "", {}, TPciFiles(), NoNames());
+}
+TRecord PciBridgeShape(TComputerSystem const& system) { return BridgeRecord(system, "", {}, TPciFiles(), NoNames()); }
+TRecord PciLinkShape(TComputerSystem const& system) { return LinkRecord(system, "", TPciFiles()); }
+
+TMissing WhyNoPciDevices(TMachineFiles const& files) {
+  if (!files.Exists(kDevices)) return {kMissingNotGiven, "the kernel lists no PCI devices: " + kDevices + " does not exist"};
+  return {kMissingNotGiven, "no PCI devices are listed in " + kDevices};
+}
+
+std::vector<TPciSlot> PciSlots(TMachineFiles const& files) {
+  std::vector<TPciSlot> slots;
+  for (std::string const& name : files.Names(kSlots)) {
+    auto const address = files.Line(kSlots + name + "/address");
+    TRecord record("CIM_Slot", "sysfs");
+    record.AddKey("Tag", "PCI slot " + name);
+    record.AddKey("CreationClassName", "CIM_Slot");
+    record.Add("ElementName", TText(name));
+    record.Add("PoweredOn", files.Number<unsigned>(kSlots + name + "/power").Then([](unsigned power) { return power != 0; }));
+    slots.push_back({address ? *address : "", record});
+  }
+  return slots;
+}
+
+TRecord PciSlotShape() {
+  TRecord record("CIM_Slot", "sysfs");
+  record.AddKey("Tag", "");
+  record.AddKey("CreationClassName", "CIM_Slot");
+  record.Add("ElementName", TText(Unread()));
+  record.Add("PoweredOn", TFinding<bool>(Unread()));
+  return record;
+}
+
+}  // namespace NQRVZEP20
