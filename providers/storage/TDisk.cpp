@@ -108,9 +108,9 @@ TMissing NotReported(char const* fact) {
 
 }  // namespace
 
-TDisk DiskOf(TMachineFiles const& files, TBlockDevice const& drive) {
+TDisk DiskOf(TMachineFiles const& files, TBlockDevice const& drive, TUdevRecord const& udev) {
   TDisk disk{drive,
-             TUdevRecord::Of(files, NumberOf(files, drive)),
+             udev,
              AttachmentOf(files, drive),
              NotReported("maker"),
              NotReported("model"),

@@ -24,6 +24,6 @@ struct TDisk {
   std::vector<TDesignator> fDesignators;   // names that are unique in the world, the best first
 };
 
-TDisk DiskOf(TMachineFiles const& files, TBlockDevice const& drive);
+TDisk DiskOf(TMachineFiles const& files, TBlockDevice const& drive, TUdevRecord const& udev);
 
 }  // namespace NQRVZEP20

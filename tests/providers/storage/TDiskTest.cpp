@@ -23,7 +23,10 @@ protected:
     return texts;
   }
 
-  TDisk Disk() const { return DiskOf(fTree.fFiles, BlockDevicesOf(fTree.fFiles).at(0)); }
+  TDisk Disk() const {
+    TBlockDevice const device = BlockDevicesOf(fTree.fFiles).at(0);
+    return DiskOf(fTree.fFiles, device, TUdevRecord::Of(fTree.fFiles, NumberOf(fTree.fFiles, device)));
+  }
 
   void AddScsi(std::string const& device) {
     fTree.AddDisk(device, "sda", "8:0", "8");
@@ -108,7 +111,7 @@ TEST_F(TDiskTest, HostileTextsAreKeptAsTheyAre) {
 }
 
 TEST_F(TDiskTest, AMissingDeviceHasReasonsOnly) {
-  TDisk const disk = DiskOf(fTree.fFiles, TBlockDevice());
+  TDisk const disk = DiskOf(fTree.fFiles, TBlockDevice(), TUdevRecord(TMissing()));
   EXPECT_EQ(TextOf(disk.fModel), "<neither the drive nor the kernel reports the model>");
   EXPECT_EQ(TextOf(disk.fAttachment.fTransport), "</sys/devices/none/none/device does not exist>");
 }
