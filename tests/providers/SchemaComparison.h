@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// How the classes that a provider declares differ from the classes of the same name in the DMTF schema.
+// How the classes that a provider declares differ from the classes of the same name in a schema: that of the DMTF, with the MOF
+// files of the providers.
 
 #include "collect/TValueWords.h"
 #include "tests/providers/memory/Collect.h"
@@ -82,6 +83,9 @@ private:
       else
         CompareProperty(name + "." + propertyName, *property, *found->second);
     }
+    if (name.rfind("ZEP_", 0) == 0)
+      for (auto const& property : All(*cls, &ICIMClass::EnumeratePropertyDecls))
+        if (ofProvider.count(property->GetName(kNone)) == 0) Add(name + "." + property->GetName(kNone) + ": not declared");
     if (!ofProvider.empty() && KeysOf(ofProvider) != KeysOf(ofSchema)) Add(name + ": keys differ");
   }
 
