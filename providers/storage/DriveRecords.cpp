@@ -21,6 +21,7 @@ constexpr char const* kSource = "sysfs, udev";
 
 // Values of the schema (ValueNames.h).
 constexpr unsigned short kSequentialAccess = 2, kRandomAccess = 3, kWriting = 4, kRemovableMedia = 7;
+constexpr unsigned short kPredictiveFailure = 5, kHealthy = 5, kMajorFailure = 20;
 constexpr unsigned short kHardDisk = 2, kSolidState = 3;
 constexpr unsigned short kOtherFormFactor = 1, kFormFactor525 = 3;
 constexpr unsigned short kOther = 1, kATA = 3, kSATA = 4, kSAS = 5, kFC = 6;
@@ -38,10 +39,30 @@ constexpr TStateStatus kStates[] = {
     {"deleting (no IO)", 9},
 };
 
-TCodes StatusFrom(std::string const& state) {
+// The state of a drive: values of OperationalStatus, and a text for each.
+struct TStatus {
+  std::vector<unsigned short> fCodes;
+  std::vector<std::string> fTexts;
+};
+
+TFinding<TStatus> StatusFrom(std::string const& state) {
   auto const found = std::find_if(std::begin(kStates), std::end(kStates), [&](auto const& row) { return row.fState == state; });
   if (found == std::end(kStates)) return TMissing{kMissingUnexpected, "the kernel reports the state \"" + state + "\""};
-  return std::vector<unsigned short>{found->fStatus};
+  return TStatus{{found->fStatus}, {state}};
+}
+
+// The state that the kernel reports, and that of a disk that is failing by its own judgement.
+TFinding<TStatus> StatusOf(TDisk const& disk, TFinding<bool> const& passed) {
+  TFinding<TStatus> const ofKernel = disk.fState.Then(StatusFrom);
+  if (!passed || *passed) return ofKernel;
+  TStatus status = ofKernel ? *ofKernel : TStatus();
+  status.fCodes.push_back(kPredictiveFailure);
+  status.fTexts.push_back("the disk reports that it is failing");
+  return status;
+}
+
+TCode HealthStateOf(TFinding<bool> const& passed) {
+  return passed.Then([](bool isHealthy) { return isHealthy ? kHealthy : kMajorFailure; });
 }
 
 // The identifiers of a drive with their meanings, for two parallel arrays.
@@ -87,16 +108,16 @@ bool IsVirtual(TDisk const& disk) {
   return disk.fAttachment.fTransport && (*disk.fAttachment.fTransport == "virtio" || *disk.fAttachment.fTransport == "xen");
 }
 
-TCode DiskTypeOf(TMachineFiles const& files, TDisk const& disk) {
+TCode DiskTypeOf(TMachineFiles const& files, TDisk const& disk, TFinding<unsigned> const& rotations) {
   if (IsVirtual(disk)) return TMissing{kMissingNotApplicable, "the kernel does not know the medium behind a virtual disk"};
-  if (disk.fRotationsPerMinute) return *disk.fRotationsPerMinute == 0 ? kSolidState : kHardDisk;
+  if (rotations) return *rotations == 0 ? kSolidState : kHardDisk;
   return files.Number<int>(disk.fDevice.File("queue/rotational")).Then([](int isRotating) {
     return isRotating != 0 ? kHardDisk : kSolidState;
   });
 }
 
-TFinding<unsigned int> RotationsOf(TDisk const& disk) {
-  return disk.fRotationsPerMinute.Then([](unsigned rotations) -> TFinding<unsigned int> {
+TFinding<unsigned int> RotationsOf(TFinding<unsigned> const& known) {
+  return known.Then([](unsigned rotations) -> TFinding<unsigned int> {
     if (rotations == 0) return TMissing{kMissingNotApplicable, "this disk does not rotate"};
     return rotations;
   });
@@ -104,8 +125,8 @@ TFinding<unsigned int> RotationsOf(TDisk const& disk) {
 
 // The schema numbers the same sizes from 3 on.
 unsigned short FormFactorFrom(unsigned code) {
-  constexpr unsigned kLessThan18 = 5;
-  return code == kLessThan18 ? kOtherFormFactor : static_cast<unsigned short>(code - 1 + kFormFactor525);
+  constexpr unsigned kSmallest = 4;
+  return code == 0 || code > kSmallest ? kOtherFormFactor : static_cast<unsigned short>(code - 1 + kFormFactor525);
 }
 
 struct TInterconnect {
@@ -132,9 +153,9 @@ TText OtherInterconnectOf(std::string const& transport) {
   return std::string(interconnect.fOtherName);
 }
 
-}  // namespace
-
-TRecord DriveRecord(char const* className, TMachineFiles const& files, TDisk const& disk, TComputerSystem const& system) {
+// The properties of drives of all kinds.
+TRecord AnyDriveRecord(char const* className, TMachineFiles const& files, TDisk const& disk, TFinding<TStatus> const& status,
+                       TComputerSystem const& system) {
   TIdentifiers const identifiers = IdentifiersOf(disk);
   TBlockDevice const& device = disk.fDevice;
   TRecord record(className, kSource);
@@ -143,20 +164,31 @@ TRecord DriveRecord(char const* className, TMachineFiles const& files, TDisk con
   record.Add("ElementName", disk.fModel);
   record.Add("OtherIdentifyingInfo", TextsFrom(identifiers.fValues));
   record.Add("IdentifyingDescriptions", TextsFrom(identifiers.fMeanings));
-  record.Add("OperationalStatus", disk.fState.Then(StatusFrom)).Names(kOperationalStatusNames);
-  record.Add("StatusDescriptions", disk.fState.Then([](auto const& state) { return std::vector<std::string>{state}; }));
+  record.Add("OperationalStatus", status.Then([](TStatus const& values) { return values.fCodes; }))
+      .Names(kOperationalStatusNames);
+  record.Add("StatusDescriptions", status.Then([](TStatus const& values) { return values.fTexts; }));
   record.Add("Capabilities", CapabilitiesOf(files, device)).Names(kCapabilitiesNames);
   record.Add("MaxMediaSize", MediaSizeOf(files, device));
   record.Add("DefaultBlockSize", files.Number<unsigned long>(device.File("queue/logical_block_size"))).Unit("byte");
   return record;
 }
 
-TRecord DiskDriveRecord(TMachineFiles const& files, TDisk const& disk, TComputerSystem const& system) {
+}  // namespace
+
+TRecord DriveRecord(char const* className, TMachineFiles const& files, TDisk const& disk, TComputerSystem const& system) {
+  return AnyDriveRecord(className, files, disk, disk.fState.Then(StatusFrom), system);
+}
+
+TRecord DiskDriveRecord(TMachineFiles const& files, TDisk const& disk, TSmartReport const& health,
+                        TComputerSystem const& system) {
   TText const& transport = disk.fAttachment.fTransport;
-  TRecord record = DriveRecord("CIM_DiskDrive", files, disk, system);
-  record.Add("DiskType", DiskTypeOf(files, disk)).Names(kDiskTypeNames);
-  record.Add("RPM", RotationsOf(disk)).Unit("revolution / minute");
-  record.Add("FormFactor", disk.fFormFactor.Then(FormFactorFrom)).Names(kFormFactorNames);
+  TFinding<unsigned> const& rotations = disk.fRotationsPerMinute ? disk.fRotationsPerMinute : health.fRotationsPerMinute;
+  TRecord record = AnyDriveRecord("CIM_DiskDrive", files, disk, StatusOf(disk, health.fPassed), system);
+  record.Add("HealthState", HealthStateOf(health.fPassed)).Names(kHealthStateNames);
+  record.Add("DiskType", DiskTypeOf(files, disk, rotations)).Names(kDiskTypeNames);
+  record.Add("RPM", RotationsOf(rotations)).Unit("revolution / minute");
+  record.Add("FormFactor", (disk.fFormFactor ? disk.fFormFactor : health.fFormFactor).Then(FormFactorFrom))
+      .Names(kFormFactorNames);
   record.Add("InterconnectType", transport.Then([](auto const& name) { return InterconnectOf(name).fType; }))
       .Names(kInterconnectTypeNames);
   record.Add("OtherInterconnectType", transport.Then(OtherInterconnectOf));

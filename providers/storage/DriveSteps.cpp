@@ -10,6 +10,11 @@ constexpr TAssociation kRealizes{"CIM_Realizes", "Antecedent", "CIM_PhysicalElem
 constexpr TAssociation kSoftware{"CIM_ElementSoftwareIdentity", "Antecedent", "CIM_SoftwareIdentity", "Dependent",
                                  "CIM_ManagedElement"};
 
+TSmartReport HealthOf(TStorage const& storage, TDisk const& disk) {
+  auto const found = storage.fHealth.find(disk.fDevice.fName);
+  return found == storage.fHealth.end() ? NoSmartReport(TMissing()) : found->second;
+}
+
 TRecord RecordOf(TStorage const& storage, TDisk const& disk, TBlockDevice::EKind kind) {
   switch (kind) {
     case TBlockDevice::kOptical:
@@ -19,7 +24,7 @@ TRecord RecordOf(TStorage const& storage, TDisk const& disk, TBlockDevice::EKind
     case TBlockDevice::kTape:
       return DriveRecord("CIM_TapeDrive", storage.fFiles, disk, storage.fSystem);
     default:
-      return DiskDriveRecord(storage.fFiles, disk, storage.fSystem);
+      return DiskDriveRecord(storage.fFiles, disk, HealthOf(storage, disk), storage.fSystem);
   }
 }
 
@@ -34,6 +39,32 @@ void WriteDrivesOf(TStorage& storage, TBlockDevice::EKind kind, char const* whyN
   for (TRecord const& record : records) storage.fWriter.Associate(kSystemDevice, storage.fSystemRecord, record);
 }
 
+TMissing NoDrives() { return {kMissingNotGiven, "the kernel lists no drives"}; }
+
+// The packages of drives, and the boards of controllers that are not drives themselves.
+void WritePackages(TStorage& storage) {
+  std::vector<TRecord> packages;
+  for (TDisk const& disk : storage.fDisks) {
+    packages.push_back(PackageRecord(disk));
+    storage.fPackages.emplace(disk.fDevice.fName, packages.back());
+  }
+  for (TController const& controller : storage.fControllers) {
+    if (controller.IsNvme()) continue;
+    packages.push_back(BoardRecord(controller));
+    storage.fPackages.emplace(controller.fAddress, packages.back());
+  }
+  storage.fWriter.Write(PackageRecord(storage.fNoDisk), packages, NoDrives());
+  for (auto const& [name, drive] : storage.fDrives) storage.fWriter.Associate(kRealizes, storage.fPackages.at(name), drive);
+}
+
+void WriteFirmware(TStorage& storage) {
+  std::vector<TRecord> records;
+  for (TDisk const& disk : storage.fDisks) records.push_back(FirmwareRecord(disk));
+  storage.fWriter.Write(FirmwareRecord(storage.fNoDisk), records, NoDrives());
+  for (std::size_t i = 0; i < records.size(); ++i)
+    storage.fWriter.Associate(kSoftware, records[i], storage.fDrives.at(storage.fDisks[i].fDevice.fName));
+}
+
 }  // namespace
 
 void WriteDrives(TStorage& storage) {
@@ -41,21 +72,8 @@ void WriteDrives(TStorage& storage) {
   WriteDrivesOf(storage, TBlockDevice::kOptical, "the kernel lists no optical drives: no device in /sys/class/block is one");
   WriteDrivesOf(storage, TBlockDevice::kDiskette, "the kernel lists no floppy drives: no device in /sys/class/block is one");
   WriteDrivesOf(storage, TBlockDevice::kTape, "the kernel lists no tape drives: /sys/class/scsi_tape has none");
-
-  TMissing const whyNone{kMissingNotGiven, "the kernel lists no drives"};
-  std::vector<TRecord> packages, firmware;
-  for (TDisk const& disk : storage.fDisks) {
-    packages.push_back(PackageRecord(disk));
-    firmware.push_back(FirmwareRecord(disk));
-  }
-  storage.fWriter.Write(PackageRecord(storage.fNoDisk), packages, whyNone);
-  storage.fWriter.Write(FirmwareRecord(storage.fNoDisk), firmware, whyNone);
-  for (std::size_t i = 0; i < storage.fDisks.size(); ++i) {
-    std::string const& name = storage.fDisks[i].fDevice.fName;
-    storage.fPackages.emplace(name, packages[i]);
-    storage.fWriter.Associate(kRealizes, packages[i], storage.fDrives.at(name));
-    storage.fWriter.Associate(kSoftware, firmware[i], storage.fDrives.at(name));
-  }
+  WritePackages(storage);
+  WriteFirmware(storage);
 }
 
 }  // namespace NQRVZEP20

@@ -35,12 +35,16 @@ TStorage::TStorage(TMemoryNamespace& ns, TMachineFiles const& files)
       fWriter(ns),
       fDevices(KnownDevicesOf(files)),
       fDisks(DisksOf(files, fDevices)),
+      fControllers(ControllersOf(fDisks)),
+      fHealth(HealthOf(files, fDisks)),
       fNoDisk(DiskOf(files, TBlockDevice(), TUdevRecord(TMissing()))) {}
 
 void FillStorageNamespace(TMemoryNamespace& ns, TMachineFiles const& files) {
   TStorage storage(ns, files);
   storage.fWriter.Write(storage.fSystemRecord);
   WriteDrives(storage);
+  WriteControllersAndSlots(storage);
+  WriteHealth(storage);
   WriteExtents(storage);
   WriteVolumes(storage);
   WriteBlockDevices(storage);

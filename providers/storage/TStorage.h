@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "Controllers.h"
 #include "FileSystems.h"
+#include "Health.h"
 #include "TDisk.h"
 #include "providers/reasons/TComputerSystem.h"
 #include "providers/reasons/TMachineFiles.h"
@@ -22,7 +24,7 @@ class TMemoryNamespace;
 struct TStorage {
   using TByName = std::map<std::string, TRecord>;
 
-  // Finds the devices.
+  // Finds the devices, and asks the disks for their health, which may take seconds.
   TStorage(TMemoryNamespace& ns, TMachineFiles const& files);
 
   TMachineFiles const& fFiles;
@@ -31,12 +33,17 @@ struct TStorage {
   TRecordWriter fWriter;
   std::vector<TKnownDevice> const fDevices;
   std::vector<TDisk> const fDisks;  // all drives
-  TDisk const fNoDisk;              // without values, for the declaration of a class
-  TByName fDrives, fPackages, fExtents;
+  std::vector<TController> const fControllers;
+  std::map<std::string, TSmartReport> const fHealth;
+  TDisk const fNoDisk;  // without values, for the declaration of a class
+  TByName fDrives, fExtents;
+  TByName fPackages;  // also those of controllers, by their addresses
 };
 
 // The steps, in the order in which they are called. Each writes its records and associations.
-void WriteDrives(TStorage& storage);        // drives, packages, firmware
+void WriteDrives(TStorage& storage);  // drives, packages, firmware
+void WriteControllersAndSlots(TStorage& storage);
+void WriteHealth(TStorage& storage);        // health and wear of disks
 void WriteExtents(TStorage& storage);       // media, partitions, devices without hardware
 void WriteVolumes(TStorage& storage);       // RAID arrays and volumes of the device mapper
 void WriteBlockDevices(TStorage& storage);  // what the schema has no property for

@@ -36,13 +36,13 @@ TEST_F(StorageNamespaceTest, AMachineWithoutSysfsHasReasonsForEveryClass) {
   Fill();
   EXPECT_THAT(ReasonsForNoInstance(),
               ElementsAre("CIM_DiskDrive", "CIM_CDROMDrive", "CIM_DisketteDrive", "CIM_TapeDrive", "CIM_PhysicalPackage",
-                          "CIM_SoftwareIdentity", "CIM_StorageExtent", "CIM_GenericDiskPartition", "CIM_DiskPartition",
-                          "CIM_GPTDiskPartition", "CIM_LogicalDisk", "CIM_StorageVolume", "ZEP_RaidArray", "ZEP_RaidMember",
-                          "ZEP_BlockDevice", "ZEP_BlockQueue", "CIM_UnixLocalFileSystem", "CIM_RemoteFileSystem", "ZEP_Mount",
-                          "ZEP_SwapArea"));
+                          "CIM_SoftwareIdentity", "CIM_PCIController", "CIM_Slot", "ZEP_DiskHealth", "ZEP_SmartAttribute",
+                          "CIM_StorageExtent", "CIM_GenericDiskPartition", "CIM_DiskPartition", "CIM_GPTDiskPartition",
+                          "CIM_LogicalDisk", "CIM_StorageVolume", "ZEP_RaidArray", "ZEP_RaidMember", "ZEP_BlockDevice",
+                          "ZEP_BlockQueue", "CIM_UnixLocalFileSystem", "CIM_RemoteFileSystem", "ZEP_Mount", "ZEP_SwapArea"));
 }
 
-TEST_F(StorageNamespaceTest, AssociationsLeadFromAPartitionToTheDisk) {
+TEST_F(StorageNamespaceTest, AssociationsLeadFromAPartitionToTheController) {
   std::string const device = "/sys/devices/pci0000:00/0000:00:1f.2/host0/target0:0:0/0:0:0:0";
   fTree.AddDisk(device, "sda", "8:0", "2048");
   fTree.AddPartition(device + "/block/sda", "sda1", "8:1", "34", "1000");
@@ -54,9 +54,10 @@ TEST_F(StorageNamespaceTest, AssociationsLeadFromAPartitionToTheDisk) {
   EXPECT_THAT(Values("CIM_BasedOn", "Antecedent"), ElementsAre(HasSubstr("DeviceID=\"sda\"")));
   EXPECT_THAT(Values("CIM_BasedOn", "Dependent"), ElementsAre(HasSubstr("DeviceID=\"sda1\"")));
   EXPECT_THAT(Values("CIM_BasedOn", "StartingAddress"), ElementsAre("17408"));
-  EXPECT_EQ(Values("CIM_SystemDevice", "PartComponent").size(), 4u);
+  EXPECT_EQ(Values("CIM_SystemDevice", "PartComponent").size(), 5u);
   EXPECT_EQ(Values("CIM_ElementSoftwareIdentity", "Dependent").size(), 2u);
-  EXPECT_EQ(Values("CIM_Realizes", "Dependent").size(), 2u);
+  EXPECT_EQ(Values("CIM_Realizes", "Dependent").size(), 3u);
+  EXPECT_THAT(Values("CIM_ControlledBy", "Dependent"), ElementsAre(HasSubstr("DeviceID=\"sda\"")));
 }
 
 // Adds the answers of tests/data/storage/answers/NAME, which were recorded later than the files of the machine.

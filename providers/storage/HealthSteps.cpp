@@ -1,0 +1,35 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "Health.h"
+#include "TStorage.h"
+
+namespace NQRVZEP20 {
+
+namespace {
+
+constexpr TAssociation kStatistics{"CIM_ElementStatisticalData", "ManagedElement", "CIM_ManagedElement", "Stats",
+                                   "CIM_StatisticalData"};
+
+}  // namespace
+
+void WriteHealth(TStorage& storage) {
+  std::vector<TRecord> records, attributes;
+  std::vector<std::pair<std::string, TRecord>> ofDrives;
+  for (TDisk const& disk : storage.fDisks) {
+    if (disk.fDevice.fKind != TBlockDevice::kDisk) continue;
+    std::string const& name = disk.fDevice.fName;
+    TSmartReport const& report = storage.fHealth.at(name);
+    records.push_back(HealthRecord(name, report));
+    ofDrives.emplace_back(name, records.back());
+    for (TSmartAttribute const& attribute : report.fAttributes) {
+      attributes.push_back(AttributeRecord(name, attribute));
+      ofDrives.emplace_back(name, attributes.back());
+    }
+  }
+  TMissing const noDisks{kMissingNotGiven, "the kernel lists no disk drives"};
+  TMissing const noAttributes{kMissingNotGiven, "no disk has a table of SMART attributes that smartctl could read"};
+  storage.fWriter.Write(HealthRecord("", NoSmartReport(noDisks)), records, noDisks);
+  storage.fWriter.Write(AttributeRecord("", TSmartAttribute()), attributes, noAttributes);
+  for (auto const& [name, record] : ofDrives) storage.fWriter.Associate(kStatistics, storage.fDrives.at(name), record);
+}
+
+}  // namespace NQRVZEP20
