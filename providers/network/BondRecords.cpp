@@ -18,6 +18,11 @@ constexpr TValueName kAlgorithms[] = {{"1", "Other"}, {"2", "No Load Balancing"}
 constexpr std::uint16_t kOtherAlgorithm = 1, kNoBalancing = 2, kRoundRobin = 3;
 constexpr TValueName kInterfaceType[] = {{"161", "IEEE 802.3ad Link Aggregate"}};
 
+// Settings that few bonds change.
+constexpr char const* kOtherSettings[] = {
+    "use_carrier", "arp_validate", "arp_all_targets",   "arp_missed_max", "primary_reselect",  "num_grat_arp", "peer_notif_delay",
+    "resend_igmp", "lp_interval",  "packets_per_slave", "tlb_dynamic_lb", "all_slaves_active", "lacp_active"};
+
 // The first word of a line such as "active-backup 1".
 std::string FirstWord(std::string const& line) { return line.substr(0, line.find(' ')); }
 
@@ -122,6 +127,7 @@ TRecord BondRecord(TMachineFiles const& files, TLink const& bond, TLinks const& 
   record.Add("FailOverMAC", word("bonding/fail_over_mac"));
   record.Add("TransmitHashPolicy", word("bonding/xmit_hash_policy"));
   AddLacp(record, of, mode);
+  record.Add("OtherSettings", of.Settings("bonding", kOtherSettings));
   return record;
 }
 

@@ -18,6 +18,15 @@ constexpr char const* kCentiseconds = "second * 10^-2";
 constexpr char const* kSpanningTree[] = {"off", "kernel", "user"};
 constexpr char const* kPortStates[] = {"disabled", "listening", "learning", "forwarding", "blocking"};
 
+// Settings that few bridges change.
+constexpr char const* kOtherSettings[] = {
+    "group_addr",        "group_fwd_mask",         "no_linklocal_learn",      "vlan_stats_enabled", "multicast_router",
+    "multicast_querier", "multicast_igmp_version", "multicast_mld_version",   "nf_call_iptables",   "nf_call_ip6tables",
+    "nf_call_arptables", "topology_change",        "topology_change_detected"};
+constexpr char const* kOtherPortSettings[] = {"bpdu_guard",    "root_block",      "multicast_fast_leave", "multicast_flood",
+                                              "unicast_flood", "broadcast_flood", "multicast_router",     "proxyarp",
+                                              "proxyarp_wifi", "neigh_suppress",  "group_fwd_mask"};
+
 template <std::size_t N>
 TFinding<std::string> WordOf(TFinding<std::uint32_t> const& number, char const* const (&words)[N]) {
   return number.Then([&](std::uint32_t state) -> TFinding<std::string> {
@@ -65,6 +74,7 @@ TRecord BridgeRecord(TMachineFiles const& files, TLink const& bridge, TLinks con
   record.Add("VLANProtocol", of.Line("bridge/vlan_protocol").Then(VlanProtocolFrom));
   record.Add("DefaultPVID", number("default_pvid"));
   record.Add("MulticastSnooping", IsOn(number("multicast_snooping")));
+  record.Add("OtherSettings", of.Settings("bridge", kOtherSettings));
   return record;
 }
 
@@ -86,6 +96,7 @@ TRecord BridgePortRecord(TMachineFiles const& files, TLink const& member, TLinks
   record.Add("Hairpin", IsOn(number("hairpin_mode")));
   record.Add("Learning", IsOn(number("learning")));
   record.Add("Isolated", IsOn(number("isolated")));
+  record.Add("OtherSettings", of.Settings("brport", kOtherPortSettings));
   return record;
 }
 

@@ -97,8 +97,15 @@ public:
     return fIsThere ? fFiles.Number<T>(fDirectory + name) : WhyAbsent();
   }
 
-  std::vector<std::string> Names(std::string const& directory) const {
-    return fIsThere ? fFiles.Names(fDirectory + directory) : std::vector<std::string>();
+  // The first word of each of these files in the directory, as "arp_validate: none". A file that this kernel lacks is left out;
+  // missing if there is none of them.
+  template <std::size_t N>
+  TFinding<std::vector<std::string>> Settings(std::string const& directory, char const* const (&names)[N]) const {
+    std::vector<std::string> settings;
+    for (char const* const name : names)
+      if (auto const line = Line(directory + "/" + name)) settings.push_back(name + (": " + line->substr(0, line->find(' '))));
+    if (settings.empty()) return Line(directory + "/" + names[0]).Why();
+    return settings;
   }
 
 private:

@@ -136,8 +136,19 @@ TEST_F(LinkFilesTest, SysfsOfAnotherNetworkNamespaceIsNotRead) {
   for (int other : {1, 2}) {
     EXPECT_EQ(TLinkFiles(fFiles, links.fAll.at(other)).Number<int>("mtu").Why().fReason,
               "/sys/class/net does not describe this network namespace");
-    EXPECT_THAT(TLinkFiles(fFiles, links.fAll.at(other)).Names(""), testing::IsEmpty());
   }
+}
+
+TEST_F(LinkFilesTest, SettingsAreTheFirstWordsOfTheirFiles) {
+  Write("sys/class/net/bond0/bonding/arp_validate", "none 0\n");
+  Write("sys/class/net/bond0/bonding/use_carrier", "1\n");
+  TLink link;
+  link.fName = "bond0";
+  link.fIsInSysfs = true;
+  TLinkFiles const files(fFiles, link);
+  EXPECT_THAT(*files.Settings("bonding", {"arp_validate", "missing", "use_carrier"}),
+              ElementsAre("arp_validate: none", "use_carrier: 1"));
+  EXPECT_EQ(files.Settings("bonding", {"missing"}).Why().fReason, "/sys/class/net/bond0/bonding/missing does not exist");
 }
 
 TEST_F(LinkFilesTest, WithoutRtnetlinkSysfsIsRead) {
