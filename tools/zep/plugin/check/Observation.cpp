@@ -21,10 +21,12 @@ TTrial Try(TPlugInFile const& file, TPlugInArguments const& arguments) {
   return trial;
 }
 
-// A key that contains the time of day then differs from that of the first trial.
+// A key that contains the time of day then differs from that of the first trial. The clock of time(2) lags behind by up to a tick
+// of the kernel.
 void WaitForNextSecond() {
+  constexpr std::chrono::milliseconds kLongestLag(50);
   auto const now = std::chrono::system_clock::now();
-  std::this_thread::sleep_for(std::chrono::ceil<std::chrono::seconds>(now) - now + std::chrono::milliseconds(1));
+  std::this_thread::sleep_for(std::chrono::ceil<std::chrono::seconds>(now) - now + kLongestLag);
 }
 
 void FindSchema(std::string const& mofFile, TObservation& observation) {
