@@ -69,16 +69,22 @@ function(zep_room name)
 endfunction()
 
 # A library that is loaded at run time. It is placed beside libzepcore.so under exactly the given file name. MAP: a version
-# script that lists the exported symbols, for a library that exports only some of those that its sources mark.
+# script that lists the exported symbols, for a library that exports only some of those that its sources mark. A provider plug-in
+# exports nothing, and becomes one of the targets in the global property ZEP_PROVIDER_PLUGINS.
 function(zep_loaded_library name file)
   cmake_parse_arguments(ARG "" "MAP" "" ${ARGN})
   add_library(${name} MODULE ${ARG_UNPARSED_ARGUMENTS})
   target_link_libraries(${name} PRIVATE zep_options)
   set_target_properties(${name} PROPERTIES PREFIX "" OUTPUT_NAME ${file} SUFFIX ""
     LIBRARY_OUTPUT_DIRECTORY ${ZEP_LIB_DIR} BUILD_RPATH "$ORIGIN" INSTALL_RPATH "$ORIGIN" BUILD_WITH_INSTALL_RPATH ON)
+  if(file MATCHES "\\.nsp\\.so$")
+    set_property(GLOBAL APPEND PROPERTY ZEP_PROVIDER_PLUGINS ${name})
+    set(ARG_MAP ${PROJECT_SOURCE_DIR}/cmake/ZepProvider.map)
+  endif()
   if(ARG_MAP)
-    target_link_options(${name} PRIVATE LINKER:--version-script=${CMAKE_CURRENT_SOURCE_DIR}/${ARG_MAP})
-    set_target_properties(${name} PROPERTIES LINK_DEPENDS ${CMAKE_CURRENT_SOURCE_DIR}/${ARG_MAP})
+    get_filename_component(map ${ARG_MAP} ABSOLUTE)
+    target_link_options(${name} PRIVATE LINKER:--version-script=${map})
+    set_target_properties(${name} PROPERTIES LINK_DEPENDS ${map})
   endif()
 endfunction()
 
