@@ -101,6 +101,18 @@ std::string TNamespaceView::SourceOf(ICIMPropertyDecl const& property) const {
   return source ? LabelledSource(*source, fSampleLabel) : "provider " + fProviderName;
 }
 
+bool TNamespaceView::IsOfReport(ICIMInstance const& instance) const {
+  if (fSampleLabel.empty()) return true;
+  bool isOfSample = false;
+  instance.EnumerateProperties(
+      [&](boost::shared_ptr<ICIMProperty> property) {
+        isOfSample = SourceOf(*property->GetDeclaration(TCIMContext())).compare(0, fSampleLabel.size(), fSampleLabel) == 0;
+        return !isOfSample;
+      },
+      TCIMContext());
+  return isOfSample;
+}
+
 TMissing TNamespaceView::WhyMissing(ICIMInstance const& instance, std::string const& property) const {
   return fReasons.WhyMissing(instance, property).value_or(TMissing{kMissingNotGiven, "the provider gives no value"});
 }

@@ -50,6 +50,9 @@ public:
   // The source, labelled if there is a sample (Sample.h).
   std::string SourceOf(ICIMPropertyDecl const& property) const;
 
+  // Whether the instance describes the machine of the report: with a sample, whether any of its values comes from the sample.
+  bool IsOfReport(ICIMInstance const& instance) const;
+
   TMissing WhyMissing(ICIMInstance const& instance, std::string const& property) const;
   TMissing WhyNoInstance(std::string const& className) const;
 

@@ -35,6 +35,7 @@ struct TArguments {
   std::string fTarget;  // empty: nowhere
   TTransferOptions fOptions;
   TPlugInArguments fPlugIns;
+  TReportParts fParts;
   std::string fMedium;  // the device to write to; empty for standard output
 };
 
@@ -61,7 +62,7 @@ std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::stri
 // Returns the document about the medium.
 TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
   std::string const name = ReportFileName(report, arguments.fAsJson ? ".json" : ".txt");
-  std::string const text = arguments.fAsJson ? AsVerbatimText(ReportAsJson(report)) : ReportAsText(report);
+  std::string const text = arguments.fAsJson ? AsVerbatimText(ReportAsJson(report)) : ReportAsText(report, arguments.fParts);
   TMountedMedium const medium(arguments.fMedium);
   std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);
   ThrowIfInterrupted(name + " was written to " + medium.Device() + ", which " + RemovalText(stillMountedAt));
@@ -79,7 +80,7 @@ TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
 // Returns the document of the report, or of the medium to which it was written. Without --json the report is printed here.
 TJson PrintOrWrite(TReport const& report, TArguments const& arguments) {
   if (!arguments.fMedium.empty()) return WriteToMedium(report, arguments);
-  if (!arguments.fAsJson) WriteOutput(ReportAsText(report));
+  if (!arguments.fAsJson) WriteOutput(ReportAsText(report, arguments.fParts));
   return arguments.fAsJson ? ReportAsJson(report) : TJson();
 }
 
@@ -136,7 +137,15 @@ int Report(TArguments const& arguments) {
 
 TRun AddReportArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
-  command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
+  auto* const json = command.add_flag("--json", arguments->fAsJson, "Print one JSON document, with every instance");
+  command
+      .add_option("--section", arguments->fParts.fSections,
+                  "Print only this section (repeatable): " + Joined(SectionNames(), ", "))
+      ->check(CLI::IsMember(SectionNames()).description(""))
+      ->type_name("NAME")
+      ->excludes(json);
+  command.add_flag("--full", arguments->fParts.fAllInstances, "Also print every instance with all its properties")
+      ->excludes(json);
   command.add_flag("--sample", arguments->fSample, "Report on the bundled sample, an invented server, labelled SAMPLE");
   command.add_option(
       "--to-media", arguments->fMedium,

@@ -18,6 +18,7 @@
 #include "tools/zep/commands/Providers.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Failure.h"
+#include "tools/zep/output/InstanceText.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/PlugInRows.h"
@@ -83,27 +84,6 @@ boost::shared_ptr<ICIMElement> Find(TNamespaceView const& view, std::string cons
   bool const isExact = element && (!instance || view.PathOf(*instance) == full);
   auto const printed = isExact ? nullptr : FindPrinted(view, full);
   return printed ? printed : element;
-}
-
-std::string Heading(TNamespaceView const& view, std::string const& text) {
-  std::string const& label = view.GetSampleLabel();
-  return Printable(label.empty() ? text : label + " " + text) + "\n\n";
-}
-
-std::string InstanceAsText(TNamespaceView const& view, ICIMInstance const& instance) {
-  TTable table({24, 10, 42});
-  table.Add({"Property", "Type", "Value"});
-  instance.EnumerateProperties(
-      [&](boost::shared_ptr<ICIMProperty> property) {
-        std::string const name = property->GetName(TCIMContext());
-        TCIMValue const value = property->GetValue(TCIMContext());
-        std::string const reason = value.IsNull() ? ": " + view.WhyMissing(instance, name).fReason : "";
-        TValueWords const words(*property->GetDeclaration(TCIMContext()));
-        table.Add({name, NameOf(value.GetType()), words.TextOf(value) + reason});
-        return true;
-      },
-      TCIMContext());
-  return Heading(view, view.PathOf(instance)) + table.GetText();
 }
 
 // The class and those above it, the topmost first.

@@ -4,10 +4,21 @@
 #include "collect/Report.h"
 
 #include <string>
+#include <vector>
 
 namespace NQRVZEP20::zep {
 
-// The report as text: the head lines, then tables of the identity, the details and the plug-ins.
-std::string ReportAsText(TReport const& report);
+// The parts of the report to print.
+struct TReportParts {
+  std::vector<std::string> fSections;  // keys (SectionNames); empty for all
+  bool fAllInstances = false;          // also every instance with all its properties
+};
+
+// The names of all sections: the identity, the details, those of collect/Sections.h and the plug-ins.
+std::vector<std::string> SectionNames();
+
+// The report as text: the head lines, then a table for each section. Of a section with many rows, only the first are printed,
+// unless the parts name it.
+std::string ReportAsText(TReport const& report, TReportParts const& parts = {});
 
 }  // namespace NQRVZEP20::zep

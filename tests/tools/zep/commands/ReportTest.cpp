@@ -420,6 +420,58 @@ TEST_F(ReportTest, JsonHasTheReasonForANullProperty) {
   FAIL() << "the document has no computer system";
 }
 
+// ---- Sections ----
+
+TEST_F(ReportTest, ASectionHasARowForEachInstance) {
+  TRun const run = fZep.Run({{"report", "--sample", "--section", "memory"}});
+  EXPECT_EQ(run.fStatus, 0);
+  auto const lines = LinesOf(run.fOutput);
+  ASSERT_EQ(lines.size(), 13u);
+  EXPECT_EQ(lines[3], "SAMPLE Memory modules");
+  EXPECT_EQ(lines[4], "Slot          Size    Type  Speed      Maker          Part number  Serial number");
+  EXPECT_EQ(lines[5], "CPU 1 DIMM 1  16 GiB  DDR4  2.933 GHz  Example Works  EW16R32-D4   EX4100073");
+  EXPECT_EQ(lines[12], "CPU 2 DIMM 4  16 GiB  DDR4  2.933 GHz  Example Works  EW16R32-D4   EX4106912");
+}
+
+TEST_F(ReportTest, SeveralSectionsMayBePrinted) {
+  TRun const run = fZep.Run({{"report", "--sample", "--section", "plug-ins", "--section", "identity"}});
+  EXPECT_THAT(run.fOutput, HasSubstr("\nSAMPLE Identity"));
+  EXPECT_THAT(run.fOutput, HasSubstr("\nSAMPLE Plug-in"));
+  EXPECT_THAT(run.fOutput, Not(HasSubstr("Details")));
+  EXPECT_THAT(run.fOutput, Not(HasSubstr("Memory")));
+}
+
+TEST_F(ReportTest, ClassesOfOtherPlugInsAreCounted) {
+  fZep.Add("libTest.nsp.so", TEST_PROVIDER);
+  TRun const run = Run({"--section", "other"}, {{"ZEP_TEST_PROVIDER", "odd values"}});
+  EXPECT_THAT(run.fOutput, HasSubstr("\nOther classes"));
+  EXPECT_THAT(run.fOutput, testing::ContainsRegex("\n[A-Za-z_]+ +[0-9]+ +root/test"));
+}
+
+TEST_F(ReportTest, EveryInstanceIsPrintedOnRequest) {
+  TRun const run = fZep.Run({{"report", "--sample", "--full", "--section", "identity"}});
+  auto const document = JsonOf(fZep.Run({{"report", "--sample", "--json"}}));
+  std::size_t instances = 0;
+  for (auto const& instance : document["instances"]) {
+    if (instance["class"] == "ZEP_MissingValue") continue;
+    bool const isOfSample = run.fOutput.find("\nSAMPLE " + instance["path"].get<std::string>() + "\n") != std::string::npos;
+    EXPECT_TRUE(isOfSample || instance["class"] == "QRVSG_OperatingSystem" || instance["class"] == "QRVSG_ZEPProduct" ||
+                instance["class"] == "QRVSG_SCSIDevice")
+        << instance["path"];
+    instances += isOfSample ? 1 : 0;
+  }
+  EXPECT_GT(instances, 10u);
+  EXPECT_THAT(run.fOutput, Not(HasSubstr("ZEP_MissingValue")));
+}
+
+TEST_F(ReportTest, AnUnknownSectionIsWrongUsage) {
+  TRun const run = fZep.Run({{"report", "--section", "nothing"}});
+  EXPECT_EQ(run.fStatus, 64);
+  EXPECT_THAT(run.fErrors, HasSubstr("--section"));
+  EXPECT_EQ(fZep.Run({{"report", "--section", "memory", "--json"}}).fStatus, 64);
+  EXPECT_EQ(fZep.Run({{"report", "--full", "--json"}}).fStatus, 64);
+}
+
 // ---- The sample ----
 
 TEST_F(ReportTest, TheSampleIsLabelledInEveryLineOfTheText) {

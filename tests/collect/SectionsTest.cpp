@@ -1,0 +1,135 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/Sections.h"
+
+#include "TMemoryInstance.h"
+#include "TMemoryNamespace.h"
+#include "providers/reasons/TRecordWriter.h"
+#include "tests/Support.h"
+#include "tests/collect/SamplePlugIns.h"
+
+#include <gmock/gmock.h>
+#include <boost/make_shared.hpp>
+
+namespace NQRVZEP20 {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+class SectionsTest : public testing::Test {
+protected:
+  TPlugIn PlugIn(std::string const& sampleLabel = "") const {
+    return {"Test", "libTest.nsp.so", 0, "", {{"Test", std::make_shared<TNamespaceView>("Test", fNs, sampleLabel), 0, ""}}};
+  }
+
+  // The rows of a section, each as its cells separated by "|"; a missing value is its reason in angle brackets.
+  std::vector<std::string> Rows(std::string const& key, std::string const& sampleLabel = "") const {
+    auto const sections = MakeSections({PlugIn(sampleLabel)}, {key});
+    EXPECT_EQ(sections.size(), 1u);
+    fWhyEmpty = sections.at(0).fWhyEmpty;
+    std::vector<std::string> rows;
+    for (auto const& row : sections[0].fRows) {
+      std::string text;
+      for (auto const& cell : row)
+        text += (text.empty() ? "" : "|") + (cell.IsKnown() ? *cell.fValue : "<" + cell.fMissing.fReason + ">");
+      rows.push_back(text);
+    }
+    return rows;
+  }
+
+  boost::shared_ptr<TMemoryNamespace> const fNs = boost::make_shared<TMemoryNamespace>("root/test");
+  TRecordWriter fWriter{*fNs};
+  mutable std::string fWhyEmpty;
+};
+
+constexpr TValueName kTypes[] = {{"24", "DDR3"}, {"26", "DDR4"}};
+
+TRecord Module(std::string const& slot, TFinding<unsigned long> const& capacity) {
+  TRecord record("CIM_PhysicalMemory", "SMBIOS type 17");
+  record.AddKey("Tag", slot);
+  record.Add("ElementName", TFinding<std::string>(slot));
+  record.Add("Capacity", capacity).Unit("byte");
+  record.Add("MemoryType", TFinding<unsigned short>(26)).Names(kTypes);
+  record.Add("ConfiguredMemoryClockSpeed", TFinding<unsigned>(2933)).Unit("hertz * 10^6");
+  record.Add("Manufacturer", TFinding<std::string>("Example Works"));
+  record.Add("PartNumber", TFinding<std::string>("EX-16"));
+  record.Add("SerialNumber", TFinding<std::string>(TMissing{kMissingPlaceholder, "placeholder text \"0\""}));
+  return record;
+}
+
+TEST_F(SectionsTest, EachInstanceIsARowWithUnitsNamesAndReasons) {
+  fWriter.Write(Module("", 0ul), {Module("DIMM 1", 17179869184ul), Module("DIMM 2", TMissing{kMissingNotGiven, "unknown size"})},
+                {});
+  fWriter.WriteMissing();
+  EXPECT_THAT(Rows("memory"), ElementsAre("DIMM 1|16 GiB|DDR4|2.933 GHz|Example Works|EX-16|<placeholder text \"0\">",
+                                          "DIMM 2|<unknown size>|DDR4|2.933 GHz|Example Works|EX-16|<placeholder text \"0\">"));
+}
+
+TEST_F(SectionsTest, TheTitleAndColumnsAreGiven) {
+  auto const sections = MakeSections({PlugIn()}, {"usb", "disks"});
+  ASSERT_EQ(sections.size(), 2u);
+  EXPECT_EQ(sections[0].fKey, "disks");
+  EXPECT_EQ(sections[1].fTitle, "USB devices");
+  EXPECT_THAT(sections[1].fColumns, ElementsAre("Device", "Maker", "Product", "Serial number"));
+}
+
+TEST_F(SectionsTest, AnIdentifierIsFoundByItsDescription) {
+  TRecord drive("CIM_DiskDrive", "sysfs");
+  drive.AddKey("DeviceID", "sda");
+  drive.Add("ElementName", TFinding<std::string>("Model 5"));
+  drive.Add("IdentifyingDescriptions", TFinding<std::vector<std::string>>(std::vector<std::string>{"NAA", "Serial number"}));
+  drive.Add("OtherIdentifyingInfo", TFinding<std::vector<std::string>>(std::vector<std::string>{"5000c500", "Z1"}));
+  fWriter.Write(drive);
+  EXPECT_THAT(Rows("disks"), ElementsAre("sda|Model 5|Z1|<the provider has no property MaxMediaSize>|"
+                                         "<the provider has no property StatusDescriptions>"));
+}
+
+TEST_F(SectionsTest, AnInstanceThatHasOnlyItsNameIsOmitted) {
+  TRecord device("CIM_PCIDevice", "sysfs");
+  device.AddKey("DeviceID", "0000:00:01.0");
+  fWriter.Write(device);
+  EXPECT_THAT(Rows("pci"), IsEmpty());
+}
+
+TEST_F(SectionsTest, AnEmptySectionHasItsReason) {
+  EXPECT_THAT(Rows("memory"), IsEmpty());
+  EXPECT_EQ(fWhyEmpty, "no provider describes them");
+  fWriter.Write(Module("", 0ul), {}, {kMissingNotGiven, "every slot is empty"});
+  fWriter.WriteMissing();
+  EXPECT_THAT(Rows("memory"), IsEmpty());
+  EXPECT_EQ(fWhyEmpty, "every slot is empty");
+}
+
+TEST_F(SectionsTest, WithASampleTheRowsOfThisMachineAreNotShown) {
+  fWriter.Write(Module("DIMM 1", 1ul));
+  EXPECT_THAT(Rows("memory", "SAMPLE"), IsEmpty());
+  EXPECT_EQ(fWhyEmpty, "the sample does not describe them");
+  auto const sections = MakeSections(SamplePlugIns(), {"memory"});
+  EXPECT_EQ(sections.at(0).fRows.size(), 8u);
+}
+
+TEST_F(SectionsTest, OtherClassesAreCounted) {
+  fWriter.Write(Module("DIMM 1", 1ul));
+  fNs->DefineClass("X_Battery").Key("Name", "string");
+  fNs->DefineClass("X_Cell", "X_Battery");
+  fNs->AddInstance("X_Battery", {{"Name", "front"}});
+  fNs->AddInstance("X_Cell", {{"Name", "1"}});
+  fNs->AddInstance("X_Cell", {{"Name", "2"}});
+  fWriter.WriteMissing();
+  EXPECT_THAT(Rows("other"), ElementsAre("X_Battery|1|root/test", "X_Cell|2|root/test"));
+}
+
+TEST_F(SectionsTest, WithASampleTheClassesOfThisMachineAreNotCounted) {
+  fNs->DefineClass("X_Battery").Key("Name", "string");
+  fNs->AddInstance("X_Battery", {{"Name", "front"}});
+  EXPECT_THAT(Rows("other", "SAMPLE"), IsEmpty());
+}
+
+TEST_F(SectionsTest, EveryKeyMakesASection) {
+  auto const keys = SectionKeys();
+  EXPECT_EQ(MakeSections({PlugIn()}, keys).size(), keys.size());
+  EXPECT_THAT(MakeSections({PlugIn()}, {"none"}), IsEmpty());
+}
+
+}  // namespace
+}  // namespace NQRVZEP20
