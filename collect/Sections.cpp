@@ -73,7 +73,7 @@ std::vector<TSubject> const& Subjects() {
        "File systems",
        "CIM_LocalFileSystem",
        {{"File system", "Name"},
-        {"Mounted on", "Root"},
+
         {"Type", "FileSystemType"},
         {"Size", "FileSystemSize"},
         {"Free", "AvailableSpace"},
