@@ -83,6 +83,7 @@ TLink LinkFrom(ifinfomsg const& header, TNetlinkAttributes const& attributes) {
   link.fLower = LowerIn(attributes);
   link.fParentBus = attributes.Text(IFLA_PARENT_DEV_BUS_NAME);
   link.fParentDevice = attributes.Text(IFLA_PARENT_DEV_NAME);
+  link.fPhysicalPort = attributes.Text(IFLA_PHYS_PORT_NAME);
   link.fCounters = CountersIn(attributes.Bytes(IFLA_STATS64));
   if (link.IsKind("vlan")) ReadVlan(link, info.Nested(IFLA_INFO_DATA));
   return link;

@@ -50,6 +50,7 @@ struct TLink {
   TValue<std::uint32_t> fLower = WhyAbsent();         // the index of the interface below, in this network namespace
   TValue<std::string> fParentBus = WhyAbsent();       // "pci"
   TValue<std::string> fParentDevice = WhyAbsent();    // "0000:00:03.0"
+  TValue<std::string> fPhysicalPort = WhyAbsent();    // "p0": the name of the port on its device
   TValue<std::uint16_t> fVlanId = WhyAbsent();        // of a VLAN interface
   TValue<std::uint16_t> fVlanProtocol = WhyAbsent();  // 0x8100 or 0x88a8
   TValue<std::uint32_t> fVlanFlags = WhyAbsent();

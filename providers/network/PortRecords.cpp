@@ -79,6 +79,7 @@ struct TIdentity {
 TIdentity IdentityOf(TLink const& link) {
   TIdentity identity;
   if (link.fParentDevice) identity.Add(*link.fParentDevice, link.fParentBus ? *link.fParentBus + " device" : "device");
+  if (link.fPhysicalPort) identity.Add(*link.fPhysicalPort, "physical port");
   for (std::string const& name : link.fOtherNames) identity.Add(name, "alternative name");
   return identity;
 }

@@ -103,7 +103,7 @@ TRoutes RoutesIn(std::string const& dump, TLinks const& links) {
   bool const isCutOff = IsCutOff(dump);
   if (count > kInstanceLimit || isCutOff)
     routes.fWhyNotAll = WhyNotAll((isCutOff ? "more than " : "") + std::to_string(count) + " routes");
-  if (count == 0) routes.fWhyNotAll = TMissing{kMissingNotGiven, "the kernel lists no route"};
+  if (routes.fAll.empty()) routes.fWhyNotAll = TMissing{kMissingNotGiven, "the kernel lists no route"};
   return routes;
 }
 

@@ -58,7 +58,7 @@ TFinding<TLinkCounters> CountersIn(TMachineFiles const& files, std::string const
   return counters;
 }
 
-// The word after "DEVTYPE=" in the file "uevent": "bond", "bridge", "vlan", ….
+// The word after "DEVTYPE=" in the file "uevent": "bond", "bridge", "vlan", …. For a device it has another meaning: "wlan", ….
 TFinding<std::string> KindIn(std::string const& uevent) {
   std::string const key = "DEVTYPE=";
   std::size_t const begin = uevent.rfind(key, 0) == 0 ? 0 : uevent.find("\n" + key);
@@ -113,11 +113,12 @@ TLink LinkIn(TMachineFiles const& files, std::string const& name, TMissing const
   link.fLinkMode = files.Number<std::uint8_t>(directory + "/link_mode");
   link.fCarrierChanges = number("carrier_changes");
   link.fAlias = files.Line(directory + "/ifalias");
-  link.fKind = files.Content(directory + "/uevent").Then(KindIn);
   link.fMaster = number("master/ifindex");
   link.fLower = LowerIn(files, directory, link.fIndex);
   link.fParentDevice = files.RealName(directory + "/device");
   link.fParentBus = files.RealName(directory + "/device/subsystem");
+  link.fPhysicalPort = files.Line(directory + "/phys_port_name");
+  if (!link.fParentDevice) link.fKind = files.Content(directory + "/uevent").Then(KindIn);
   link.fCounters = CountersIn(files, directory);
   link.fVlanId = VlanIdOf(files, name);
   link.fIsInSysfs = true;

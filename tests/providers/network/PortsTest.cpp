@@ -83,6 +83,15 @@ TEST_F(PortsTest, WithoutAnAnswerOfTheDriverSpeedAndDuplexAreThoseOfSysfs) {
   }
 }
 
+TEST_F(PortsTest, WithoutACarrierThatIsTheReasonForAMissingSpeed) {
+  AddDevice("sys/devices/platform/nic", "platform");
+  Write("sys/class/net/eth0/speed", "-1\n");
+  fLink.fHasCarrier = false;
+  TLinkSettings const settings = PortOn("sys/devices/platform/nic").fSettings;
+  EXPECT_EQ(settings.fSpeed.Why().fReason, "the port has no carrier");
+  EXPECT_EQ(settings.fIsFullDuplex.Why().fReason, "the port has no carrier");
+}
+
 TEST_F(PortsTest, WirelessPortsAreNotEthernet) {
   AddDevice("sys/devices/platform/nic", "platform");
   EXPECT_TRUE(PortOn("sys/devices/platform/nic").IsEthernet());

@@ -96,6 +96,8 @@ TEST(RouteTest, EachNextHopIsARoute) {
 }
 
 TEST(RouteTest, InvalidRoutesAreLeftOut) {
+  EXPECT_EQ(RoutesIn(RouteMessage(Header(AF_INET, 33), Over(2)) + End(), TwoLinks()).fWhyNotAll->fReason,
+            "the kernel lists no route");
   EXPECT_THAT(
       NamesIn(RouteMessage(Header(AF_INET, 33), Over(2)) + RouteMessage(Header(AF_INET6, 129), Over(2)) +
               RouteMessage(Header(AF_UNIX, 0), Over(2)) + RouteMessage(Header(AF_INET, 8), Attribute(RTA_DST, Ip("2001:db8::"))) +

@@ -78,6 +78,19 @@ TEST_F(SysfsLinksTest, WordsThatAreNoneOfTheKernelAreMissing) {
   EXPECT_FALSE(link.fVlanId);
 }
 
+TEST_F(SysfsLinksTest, ADeviceIsNotAVirtualInterface) {
+  Write("sys/class/net/wlan0/ifindex", "2\n");
+  Write("sys/class/net/wlan0/uevent", "DEVTYPE=wlan\n");
+  Write("sys/class/net/wlan0/phys_port_name", "p0\n");
+  EXPECT_TRUE(Links().fAll.at(0).IsKind("wlan"));
+  Write("sys/devices/0000:01:00.0/vendor", "0x8086\n");
+  std::filesystem::create_symlink("/sys/devices/0000:01:00.0", fDir.Path("sys/class/net/wlan0/device"));
+  TLink const link = Links().fAll.at(0);
+  EXPECT_FALSE(link.fKind);
+  EXPECT_EQ(*link.fParentDevice, "0000:01:00.0");
+  EXPECT_EQ(*link.fPhysicalPort, "p0");
+}
+
 TEST_F(SysfsLinksTest, WithoutSysfsTheReasonNamesBoth) {
   EXPECT_EQ(Links().fWhyNotAll->fReason,
             "netlink: the kernel refuses the socket: Operation not permitted; and /sys/class/net lists no interface");
