@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <cctype>
 #include <charconv>
+#include <cmath>
 #include <sstream>
 #include <vector>
 
@@ -164,7 +165,7 @@ TSpeed SpeedFrom(std::string const& text, std::string const& source) {
   constexpr double kLimit = 1e15;
   if (error != std::errc() || scale == 0 || !(number > 0 && number * scale < kLimit))
     return TMissing{kMissingNotGiven, source + " contains \"" + text + "\", which is not a speed"};
-  return static_cast<unsigned long>(number * scale + 0.5);
+  return static_cast<unsigned long>(std::llround(number * scale));
 }
 
 bool IsPciAddress(std::string const& text) {

@@ -28,11 +28,6 @@ TText MappedType(TMachineFiles const& files, TBlockDevice const& device) {
   return type ? type : TText("dm");
 }
 
-TText MapValue(TMachineFiles const& files, TBlockDevice const& device, std::string const& name) {
-  if (device.fKind == TBlockDevice::kMapped) return files.Line(device.File("dm/" + name));
-  return TMissing{kMissingNotApplicable, "this is not a device of the device mapper"};
-}
-
 // The letters before the number: "loop" for "loop0".
 std::string OtherType(TBlockDevice const& device) { return device.fName.substr(0, device.fName.find_first_of("0123456789")); }
 
@@ -87,7 +82,6 @@ TText PartitionValue(TBlockDevice const& device, TUdevRecord const& udev, char c
 TText TypeOf(TMachineFiles const& files, TBlockDevice const& device) {
   switch (device.fKind) {
     case TBlockDevice::kDisk:
-      return std::string("disk");
     case TBlockDevice::kDiskette:
       return std::string("disk");
     case TBlockDevice::kOptical:
@@ -114,8 +108,6 @@ TRecord BlockDeviceRecord(TMachineFiles const& files, TBlockDevice const& device
   record.Add("Number", NumberOf(files, device));
   record.Add("Size", SizeOf(files, device)).Unit("byte");
   record.Add("ReadOnly", Flag(files, device, "ro"));
-  record.Add("MapName", MapValue(files, device, "name"));
-  record.Add("MapUUID", MapValue(files, device, "uuid"));
   record.Add("AlignmentOffset", AlignmentOf(files, device, "alignment_offset")).Unit("byte");
   record.Add("DiscardAlignment", AlignmentOf(files, device, "discard_alignment")).Unit("byte");
   record.SetSource("udev");
@@ -128,7 +120,6 @@ TRecord BlockDeviceRecord(TMachineFiles const& files, TBlockDevice const& device
   record.Add("TableType", udev.Value("ID_PART_TABLE_TYPE"));
   record.Add("TableUUID", udev.Value("ID_PART_TABLE_UUID"));
   record.Add("EntryType", PartitionValue(device, udev, "ID_PART_ENTRY_TYPE"));
-  record.Add("EntryUUID", PartitionValue(device, udev, "ID_PART_ENTRY_UUID"));
   record.Add("EntryFlags", PartitionValue(device, udev, "ID_PART_ENTRY_FLAGS"));
   return record;
 }

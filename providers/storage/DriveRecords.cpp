@@ -57,7 +57,7 @@ TFinding<TStatus> StatusOf(TDisk const& disk, TFinding<bool> const& passed) {
   if (!passed || *passed) return ofKernel;
   TStatus status = ofKernel ? *ofKernel : TStatus();
   status.fCodes.push_back(kPredictiveFailure);
-  status.fTexts.push_back("the disk reports that it is failing");
+  status.fTexts.emplace_back("the disk reports that it is failing");
   return status;
 }
 
@@ -211,8 +211,7 @@ TRecord PackageRecord(TDisk const& disk) {
 TRecord FirmwareRecord(TDisk const& disk) {
   TRecord record("CIM_SoftwareIdentity", kSource);
   record.AddKey("InstanceID", "ZEP:firmware:" + disk.fDevice.fName);
-  record.Add("ElementName", disk.fModel.Then([](std::string const& model) { return "Firmware of " + model; }));
-  record.Add("Manufacturer", disk.fVendor);
+  record.AddOwn("ElementName", "Firmware of " + disk.fDevice.fName);
   record.Add("VersionString", disk.fFirmware);
   record.Add("Classifications", TCodes(std::vector<unsigned short>{kFirmwareClass})).Names(kClassificationsNames);
   return record;

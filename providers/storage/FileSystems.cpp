@@ -104,11 +104,13 @@ void MarkCovered(std::vector<TMount> const& mounts, TFileSystem& system) {
   system.fIsCovered = last->fId != first.fId;
 }
 
-// Names are keys: a further file system of the same name gets the number of its mount.
+// Names are keys: further file systems of the same name are numbered.
 void MakeNamesUnique(std::vector<TFileSystem>& systems) {
   std::set<std::string> names;
-  for (TFileSystem& system : systems)
-    if (!names.insert(system.fName).second && !system.fMounts.empty()) system.fName += " (mount " + system.fMounts[0].fId + ")";
+  for (TFileSystem& system : systems) {
+    std::string const name = system.fName;
+    for (int number = 2; !names.insert(system.fName).second; ++number) system.fName = name + " (" + std::to_string(number) + ")";
+  }
 }
 
 }  // namespace

@@ -15,9 +15,9 @@ void WriteHealth(TStorage& storage) {
   std::vector<TRecord> records, attributes;
   std::vector<std::pair<std::string, TRecord>> ofDrives;
   for (TDisk const& disk : storage.fDisks) {
-    if (disk.fDevice.fKind != TBlockDevice::kDisk) continue;
     std::string const& name = disk.fDevice.fName;
     TSmartReport const& report = storage.fHealth.at(name);
+    if (!HasHealth(report)) continue;
     records.push_back(HealthRecord(name, report));
     ofDrives.emplace_back(name, records.back());
     for (TSmartAttribute const& attribute : report.fAttributes) {
@@ -25,9 +25,10 @@ void WriteHealth(TStorage& storage) {
       ofDrives.emplace_back(name, attributes.back());
     }
   }
-  TMissing const noDisks{kMissingNotGiven, "the kernel lists no disk drives"};
+  TMissing const noReport{kMissingNotGiven,
+                          "no disk has a report of its health: the property HealthState of each disk has the reason"};
   TMissing const noAttributes{kMissingNotGiven, "no disk has a table of SMART attributes that smartctl could read"};
-  storage.fWriter.Write(HealthRecord("", NoSmartReport(noDisks)), records, noDisks);
+  storage.fWriter.Write(HealthRecord("", NoSmartReport(noReport)), records, noReport);
   storage.fWriter.Write(AttributeRecord("", TSmartAttribute()), attributes, noAttributes);
   for (auto const& [name, record] : ofDrives) storage.fWriter.Associate(kStatistics, storage.fDrives.at(name), record);
 }

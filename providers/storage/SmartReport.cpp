@@ -168,6 +168,11 @@ TSmartReport NoSmartReport(TMissing const& why) {
   return {why, why, why, why, why, why, why, why, why, why, why, why, why, why, why, why, why, why, why, {}};
 }
 
+bool HasHealth(TSmartReport const& report) {
+  return report.fPassed || report.fTemperature || report.fPowerOnHours || report.fPowerCycles || report.fReallocated ||
+         report.fUncorrectable || report.fPercentageUsed || !report.fAttributes.empty();
+}
+
 TSmartReport SmartReportFrom(std::string const& text) {
   TJson const json = TJson::parse(text, nullptr, false);
   if (!json.is_object()) return NoSmartReport({kMissingUnexpected, "the output of smartctl is not an object in JSON"});

@@ -32,6 +32,9 @@ struct TSmartReport {
   std::vector<TSmartAttribute> fAttributes;
 };
 
+// Whether the report has any value about the health of the disk.
+bool HasHealth(TSmartReport const& report);
+
 // A report whose values are all missing for that reason.
 TSmartReport NoSmartReport(TMissing const& why);
 

@@ -49,7 +49,7 @@ std::vector<TRaidMember> MembersOf(TMachineFiles const& files, TBlockDevice cons
 
 // The copies of the data that the layout of a RAID 10 asks for.
 unsigned CopiesFrom(int layout) {
-  unsigned const bits = static_cast<unsigned>(layout);
+  auto const bits = static_cast<unsigned>(layout);
   return std::max(1U, bits & 255) * std::max(1U, bits >> 8 & 255);
 }
 
@@ -173,8 +173,11 @@ TRecord RaidArrayRecord(TMachineFiles const& files, TRaidArray const& array, TUd
                         TComputerSystem const& system) {
   TBlockDevice const& device = array.fDevice;
   TCode const redundancy = RedundancyOf(array);
+  TText const uuid = UuidOf(files, array, udev);
+  TVolumeNames names;
+  names.Add(uuid, "RAID UUID");
   TRecord record =
-      VolumeRecord("ZEP_RaidArray", files, device, system, NameOf(array, udev), StatusOf(array), "CIM_StorageVolume");
+      VolumeRecord("ZEP_RaidArray", files, device, system, NameOf(array, udev), names, StatusOf(array), "CIM_StorageVolume");
   record.Add("ExtentStatus", ExtentStatusOf(array)).Names(kExtentStatusNames);
   record.Add("NoSinglePointOfFailure", redundancy.Then([](unsigned short number) { return number > 0; }));
   record.Add("PackageRedundancy", redundancy);
@@ -192,7 +195,7 @@ TRecord RaidArrayRecord(TMachineFiles const& files, TRaidArray const& array, TUd
   record.Add("Layout", array.fLayout);
   record.Add("ConsistencyPolicy", files.Line(device.File("md/consistency_policy")));
   record.Add("MetadataVersion", files.Line(device.File("md/metadata_version")));
-  record.Add("UUID", UuidOf(files, array, udev));
+  record.Add("UUID", uuid);
   return record;
 }
 

@@ -20,6 +20,18 @@ TText MappedName(TMachineFiles const& files, TBlockDevice const& device) {
   });
 }
 
+TVolumeNames MappedNames(TMachineFiles const& files, TBlockDevice const& device) {
+  TVolumeNames names;
+  names.Add(files.Line(device.File("dm/name")), "Device mapper name");
+  names.Add(files.Line(device.File("dm/uuid")), "Device mapper UUID");
+  return names;
+}
+
+TFinding<std::vector<std::string>> NotEmpty(std::vector<std::string> const& texts) {
+  if (texts.empty()) return TMissing{kMissingNotGiven, "the volume has no other name"};
+  return texts;
+}
+
 // The paths of a multipath device that cannot be used at present, and the number of all.
 struct TPaths {
   std::size_t fAll, fFailed;
@@ -71,8 +83,11 @@ std::vector<std::string> DevicesBelow(TMachineFiles const& files, TBlockDevice c
 }
 
 TRecord VolumeRecord(char const* className, TMachineFiles const& files, TBlockDevice const& device, TComputerSystem const& system,
-                     TText const& elementName, TFinding<TVolumeStatus> const& status, std::string const& superClass) {
+                     TText const& elementName, TVolumeNames const& names, TFinding<TVolumeStatus> const& status,
+                     std::string const& superClass) {
   TRecord record = ExtentRecord(className, files, device, system, elementName, superClass);
+  record.Add("OtherIdentifyingInfo", NotEmpty(names.fValues));
+  record.Add("IdentifyingDescriptions", NotEmpty(names.fMeanings));
   record.Add("OperationalStatus", status.Then([](TVolumeStatus const& state) { return state.fCodes; }))
       .Names(kOperationalStatusNames);
   record.Add("StatusDescriptions", status.Then([](TVolumeStatus const& state) { return state.fTexts; }));
@@ -80,7 +95,8 @@ TRecord VolumeRecord(char const* className, TMachineFiles const& files, TBlockDe
 }
 
 TRecord MappedVolumeRecord(TMachineFiles const& files, TBlockDevice const& device, TComputerSystem const& system) {
-  return VolumeRecord("CIM_StorageVolume", files, device, system, MappedName(files, device), MappedStatus(files, device));
+  return VolumeRecord("CIM_StorageVolume", files, device, system, MappedName(files, device), MappedNames(files, device),
+                      MappedStatus(files, device));
 }
 
 }  // namespace NQRVZEP20

@@ -23,9 +23,20 @@ struct TVolumeStatus {
   }
 };
 
+// Further names of a volume, and the meaning of each.
+struct TVolumeNames {
+  std::vector<std::string> fValues, fMeanings;
+
+  void Add(TFinding<std::string> const& value, char const* meaning) {
+    if (!value) return;
+    fValues.push_back(*value);
+    fMeanings.emplace_back(meaning);
+  }
+};
+
 // What volumes of all kinds have in common. `className`: CIM_StorageVolume, or one that has it as `superClass`.
 TRecord VolumeRecord(char const* className, TMachineFiles const& files, TBlockDevice const& device, TComputerSystem const& system,
-                     TFinding<std::string> const& elementName, TFinding<TVolumeStatus> const& status,
+                     TFinding<std::string> const& elementName, TVolumeNames const& names, TFinding<TVolumeStatus> const& status,
                      std::string const& superClass = "");
 
 // A CIM_StorageVolume of the device mapper: an LVM volume, an encrypted device, a multipath device.

@@ -59,7 +59,6 @@ TEST_F(BlockDeviceRecordsTest, ContentIsThatOfUdev) {
   EXPECT_EQ(LineOf(record, "ContentType"), "ext4");
   EXPECT_EQ(LineOf(record, "ContentUUID"), "5");
   EXPECT_EQ(LineOf(record, "EntryType"), "<this device is not a partition>");
-  EXPECT_EQ(LineOf(record, "MapName"), "<this is not a device of the device mapper>");
   EXPECT_EQ(LineOf(record, "AlignmentOffset"), "<" + fPath + "/alignment_offset is -1: the device is misaligned>");
 }
 

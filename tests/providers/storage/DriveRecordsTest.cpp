@@ -80,7 +80,7 @@ TEST_F(DriveRecordsTest, PackageAndFirmware) {
   EXPECT_EQ(LineOf(PackageRecord(Disk()), "Model"), "Disk");
   EXPECT_EQ(LineOf(PackageRecord(Disk()), "Manufacturer"), "MAKER");
   EXPECT_EQ(LineOf(FirmwareRecord(Disk()), "VersionString"), "1.0");
-  EXPECT_EQ(LineOf(FirmwareRecord(Disk()), "ElementName"), "Firmware of Disk");
+  EXPECT_EQ(LineOf(FirmwareRecord(Disk()), "ElementName"), "Firmware of sda");
 }
 
 }  // namespace

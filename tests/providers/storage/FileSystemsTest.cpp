@@ -58,7 +58,7 @@ TEST_F(FileSystemsTest, PlacesOfOtherFileSystems) {
 
 TEST_F(FileSystemsTest, ACoveredMountIsMarkedAndNamesAreUnique) {
   EXPECT_THAT(FileSystems("1 0 0:5 / /t rw - tmpfs tmpfs rw\n2 0 0:6 / /t rw - tmpfs tmpfs rw\n"),
-              ElementsAre("tmpfs on /t, tmpfs in memory : /t covered", "tmpfs on /t (mount 2), tmpfs in memory : /t"));
+              ElementsAre("tmpfs on /t, tmpfs in memory : /t covered", "tmpfs on /t (2), tmpfs in memory : /t"));
 }
 
 TEST_F(FileSystemsTest, FileSystemsThatAreNotMountedAreListed) {

@@ -60,20 +60,11 @@ TEST_F(StorageNamespaceTest, AssociationsLeadFromAPartitionToTheController) {
   EXPECT_THAT(Values("CIM_ControlledBy", "Dependent"), ElementsAre(HasSubstr("DeviceID=\"sda\"")));
 }
 
-// Adds the answers of tests/data/storage/answers/NAME, which were recorded later than the files of the machine.
-void AddAnswers(std::string const& name, std::string const& root) {
-  std::string const answers = TestDataPath("storage/answers/" + name);
-  if (std::filesystem::exists(answers))
-    std::filesystem::copy(answers, root + "/zep-answers",
-                          std::filesystem::copy_options::recursive | std::filesystem::copy_options::skip_existing);
-}
-
 // tests/data/storage/NAME.txt has the complete text. To renew it after a change: ZEP_RENEW_TEXTS=1 storage_tests.
 TEST_F(StorageNamespaceTest, RecordedMachinesAreDescribedCompletely) {
   for (std::string const name : {"server", "degraded"}) {
     SCOPED_TRACE(name);
     TRecordedMachine const machine(name);
-    AddAnswers(name, machine.Root());
     auto const ns = NewNamespace();
     FillStorageNamespace(*ns, TMachineFiles(machine.Root()));
     std::string const text = TextOf(*ns), file = TestDataPath("storage/" + name + ".txt");

@@ -44,6 +44,7 @@ protected:
 
 TEST_F(MappedVolumeTest, AVolumeWhosePathsWorkIsOK) {
   EXPECT_EQ(Value("ElementName"), "mpatha");
+  EXPECT_EQ(Value("OtherIdentifyingInfo"), "{ mpatha, mpath-3600 }");
   EXPECT_EQ(Value("OperationalStatus"), "{ 2 }");
   EXPECT_EQ(Value("StatusDescriptions"), "{ active }");
 }

@@ -1,0 +1,26 @@
+// SPDX-License-Identifier: Apache-2.0
+
+// Reads any text as the mount table, the list of swap areas, and the other texts of the kernel about storage. The names of file
+// systems are keys: no two may be the same.
+
+#include "fuzz/Require.h"
+#include "providers/storage/Attachment.h"
+#include "providers/storage/FileSystemUse.h"
+#include "providers/storage/FileSystems.h"
+#include "providers/storage/TRaidArray.h"
+
+#include <set>
+
+extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
+  std::string const text(reinterpret_cast<char const*>(data), size);
+  std::set<std::string> names;
+  for (NQRVZEP20::TFileSystem const& system : NQRVZEP20::FileSystemsOf(NQRVZEP20::MountsFrom(text), {}))
+    Require(names.insert(system.fName).second);
+  for (NQRVZEP20::TSwap const& swap : NQRVZEP20::SwapsFrom(text)) Require(!swap.fFile.empty());
+  static_cast<void>(NQRVZEP20::UseFrom(text));
+  static_cast<void>(NQRVZEP20::SpeedFrom(text, "fuzz"));
+  static_cast<void>(NQRVZEP20::MappedNameFrom(text, "LVM-"));
+  auto const progress = NQRVZEP20::ProgressFrom(text);
+  if (progress) Require(*progress <= 100);
+  return 0;
+}
