@@ -2,9 +2,11 @@
 #include "PciRecords.h"
 
 #include "PciLink.h"
+#include "TIdentifiers.h"
 #include "ValueNames.h"
 
 #include <algorithm>
+#include <cstdio>
 
 namespace NQRVZEP20 {
 
@@ -14,8 +16,9 @@ using TText = TFinding<std::string>;
 
 std::string const kDevices = "/sys/bus/pci/devices/";
 std::string const kSlots = "/sys/bus/pci/slots/";
+constexpr std::size_t kConfigurationLimit = 4096;
 constexpr std::uint32_t kClassOfBridges = 0x06;
-constexpr unsigned kHostBridge = 0x00, kPciBridge = 0x04;  // subclasses
+constexpr unsigned kPciBridge = 0x04;  // a subclass
 
 TMissing Unread() { return {kMissingNotDescribed, "not read"}; }
 
@@ -37,6 +40,18 @@ public:
   TText RealName(char const* file) const {
     if (fFiles == nullptr) return Unread();
     return fFiles->RealName(fDirectory + file);
+  }
+  // A little-endian number in the first 64 bytes of the configuration space, which every user may read.
+  template <class T>
+  TFinding<T> Configuration(std::size_t offset) const {
+    if (fFiles == nullptr) return Unread();
+    return fFiles->Content(fDirectory + "config", kConfigurationLimit).Then([&](std::string const& bytes) -> TFinding<T> {
+      if (bytes.size() < offset + sizeof(T)) return TMissing{kMissingUnreadable, "the configuration space is cut off"};
+      T number = 0;
+      for (std::size_t at = sizeof(T); at-- > 0;)
+        number = static_cast<T>(number << 8 | static_cast<unsigned char>(bytes[offset + at]));
+      return number;
+    });
   }
   bool Has(char const* file) const { return fFiles != nullptr && fFiles->Exists(fDirectory + file); }
 
@@ -71,22 +86,18 @@ TFinding<std::uint16_t> SubsystemNumber(TFinding<TPciNumbers> const& numbers, st
   });
 }
 
-// What identifies the function besides its names: each value with its description.
-struct TIdentifiers {
-  std::vector<std::string> fValues;
-  std::vector<std::string> fDescriptions;
-
-  void Add(char const* description, TText const& value) {
-    if (!value) return;
-    fValues.push_back(*value);
-    fDescriptions.emplace_back(description);
-  }
-};
+// The last two hexadecimal digits of the class.
+std::string ProgrammingInterfaceFrom(std::uint32_t cls) {
+  char text[3];
+  std::snprintf(text, sizeof text, "%02x", cls & 0xffu);
+  return text;
+}
 
 TIdentifiers IdentifiersOf(TPciFiles const& function, TPciNames const& names) {
   TIdentifiers identifiers;
   identifiers.Add("Vendor", names.fVendor);
   identifiers.Add("Subsystem", names.fSubsystem);
+  identifiers.Add("Programming interface", function.Number<std::uint32_t>("class").Then(ProgrammingInterfaceFrom));
   identifiers.Add("Driver", function.RealName("driver"));
   identifiers.Add("Kernel module", function.RealName("driver/module"));
   identifiers.Add("Firmware label", function.Line("label"));
@@ -100,7 +111,6 @@ TIdentifiers IdentifiersOf(TPciFiles const& function, TPciNames const& names) {
 TRecord FunctionRecord(char const* className, TComputerSystem const& system, std::string const& name, TPciAddress const& address,
                        TPciFiles const& function, TPciNames const& names) {
   auto const numbers = NumbersOf(function);
-  TIdentifiers const identifiers = IdentifiersOf(function, names);
   TRecord record(className, "pci.ids");
   system.AddDeviceKeys(record, name);
   record.Add("Name", FullNameOf(names));
@@ -116,8 +126,12 @@ TRecord FunctionRecord(char const* className, TComputerSystem const& system, std
   record.Add("BusNumber", TFinding<std::uint8_t>(address.fBus));
   record.Add("DeviceNumber", TFinding<std::uint8_t>(address.fDevice));
   record.Add("FunctionNumber", TFinding<std::uint8_t>(address.fFunction));
-  record.Add("IdentifyingDescriptions", TFinding<std::vector<std::string>>(identifiers.fDescriptions));
-  record.Add("OtherIdentifyingInfo", TFinding<std::vector<std::string>>(identifiers.fValues));
+  record.Add("CommandRegister", function.Configuration<std::uint16_t>(0x04));
+  record.Add("CacheLineSize", function.Configuration<std::uint8_t>(0x0c)).Unit("dataword * 2");
+  record.Add("LatencyTimer", function.Configuration<std::uint8_t>(0x0d)).Unit("cycle");
+  record.Add("InterruptPin", function.Configuration<std::uint8_t>(0x3d).Then([](std::uint8_t pin) { return std::uint16_t(pin); }))
+      .Names(kInterruptPinNames);
+  IdentifiersOf(function, names).AddTo(record);
   return record;
 }
 

@@ -14,7 +14,7 @@ namespace NQRVZEP20 {
 namespace {
 
 // libpci ends the process after an error unless the function that reports it does not return.
-[[noreturn]] void ThrowError(char* format, ...) { throw std::runtime_error(format); }
+__attribute__((noreturn)) void ThrowError(char* format, ...) { throw std::runtime_error(format); }
 void Ignore(char*, ...) {}
 
 constexpr std::size_t kNames = 4;

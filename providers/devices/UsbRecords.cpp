@@ -2,6 +2,7 @@
 #include "UsbRecords.h"
 
 #include "PciAddress.h"
+#include "TIdentifiers.h"
 
 #include <algorithm>
 #include <charconv>
@@ -32,6 +33,18 @@ public:
   template <class T>
   TFinding<T> Decimal(char const* file) const {
     return Number<T>(file, 10);
+  }
+
+  // The drivers of the device's interfaces, each once. `name`: that of the device.
+  std::vector<std::string> Drivers(std::string const& name) const {
+    std::vector<std::string> drivers;
+    if (fFiles == nullptr) return drivers;
+    for (std::string const& entry : fFiles->Names(fDirectory)) {
+      if (entry.compare(0, name.size() + 1, name + ":") != 0) continue;
+      auto const driver = fFiles->RealName(fDirectory + entry + "/driver");
+      if (driver && std::find(drivers.begin(), drivers.end(), *driver) == drivers.end()) drivers.push_back(*driver);
+    }
+    return drivers;
   }
 
   // The kernel writes identifiers in hexadecimal digits without a prefix.
@@ -79,6 +92,10 @@ TRecord DeviceRecord(char const* className, TComputerSystem const& system, std::
   record.Add("MaxPacketSize", device.Decimal<std::uint8_t>("bMaxPacketSize0"));
   record.Add("NumberOfConfigs", device.Decimal<std::uint8_t>("bNumConfigurations"));
   record.Add("CurrentConfigValue", device.Decimal<std::uint8_t>("bConfigurationValue"));
+  TIdentifiers identifiers;
+  for (std::string const& driver : device.Drivers(name)) identifiers.Add("Driver", driver);
+  identifiers.Add("Maximum power", device.Line("bMaxPower"));
+  identifiers.AddTo(record);
   return record;
 }
 

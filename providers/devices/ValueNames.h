@@ -35,4 +35,7 @@ constexpr TValueName kPortTypeNames[] = {{"0", "Unknown"},      {"1", "Other"}, 
                                          {"150", "PCI"},        {"151", "PCI-X"},        {"152", "PCIe"},
                                          {"153", "PCIe Gen 2"}, {"..", "DMTF Reserved"}, {"16000..65535", "Vendor Reserved"}};
 
+constexpr TValueName kInterruptPinNames[] = {{"0", "None"},  {"1", "INTA#"}, {"2", "INTB#"},
+                                             {"3", "INTC#"}, {"4", "INTD#"}, {"5", "Unknown"}};
+
 }  // namespace NQRVZEP20

@@ -69,8 +69,21 @@ TEST_F(PciRecordsTest, AFunctionHasItsNumbersAndNames) {
   EXPECT_EQ(ValueIn(record, "RevisionID"), "2");
   EXPECT_EQ(ValueIn(record, "BusNumber"), "3");
   EXPECT_EQ(ValueIn(record, "FunctionNumber"), "1");
-  EXPECT_EQ(ValueIn(record, "IdentifyingDescriptions"), "{ Vendor, NUMA node }");
-  EXPECT_EQ(ValueIn(record, "OtherIdentifyingInfo"), "{ Intel Corporation, 1 }");
+  EXPECT_EQ(ValueIn(record, "IdentifyingDescriptions"), "{ Vendor, Programming interface, NUMA node }");
+  EXPECT_EQ(ValueIn(record, "OtherIdentifyingInfo"), "{ Intel Corporation, 00, 1 }");
+}
+
+TEST_F(PciRecordsTest, RegistersComeFromTheConfigurationSpace) {
+  Add("0000:03:00.0", kPort);
+  std::string bytes(64, '\0');
+  bytes[0x04] = '\x06', bytes[0x05] = '\x04', bytes[0x0c] = '\x10', bytes[0x0d] = '\xff', bytes[0x3d] = '\x01';
+  WriteFile(fDir.Path("sys/devices/pci0000:00/0000:03:00.0/config"), bytes);
+  EXPECT_EQ(ValueIn(Only(), "CommandRegister"), "1030");
+  EXPECT_EQ(ValueIn(Only(), "CacheLineSize"), "16");
+  EXPECT_EQ(ValueIn(Only(), "LatencyTimer"), "255");
+  EXPECT_EQ(ValueIn(Only(), "InterruptPin"), "1");
+  WriteFile(fDir.Path("sys/devices/pci0000:00/0000:03:00.0/config"), bytes.substr(0, 5));
+  EXPECT_EQ(ValueIn(Only(), "CommandRegister"), "<the configuration space is cut off>");
 }
 
 TEST_F(PciRecordsTest, NamesThatTheListDoesNotContainHaveAReason) {

@@ -52,8 +52,11 @@ TEST_F(UsbRecordsTest, ADeviceIsBelowItsHubAndController) {
                                            {"version", " 2.00"},
                                            {"manufacturer", "QEMU"},
                                            {"product", "QEMU \x1b[2J<b>"},
+                                           {"bMaxPower", "100mA"},
                                            {"bMaxPacketSize0", "64"}});
   Add("pci0000:00/0000:00:01.0/usb1/1-2/1-2:1.0", {{"bInterfaceClass", "03"}});
+  fs::create_directories(fDir.Path("sys/bus/usb/drivers/usbhid"));
+  fs::create_symlink("/sys/bus/usb/drivers/usbhid", fDir.Path("sys/devices/pci0000:00/0000:00:01.0/usb1/1-2/1-2:1.0/driver"));
   auto const devices = Devices();
   ASSERT_EQ(devices.size(), 2u);
   EXPECT_EQ(devices[0].fName, "1-2");
@@ -67,6 +70,7 @@ TEST_F(UsbRecordsTest, ADeviceIsBelowItsHubAndController) {
   EXPECT_EQ(ValueIn(devices[0].fRecord, "Product"), "QEMU \x1b[2J<b>");
   EXPECT_EQ(ValueIn(devices[0].fRecord, "SerialNumber"), "<the device does not report it>");
   EXPECT_EQ(ValueIn(devices[0].fRecord, "MaxPacketSize"), "64");
+  EXPECT_EQ(ValueIn(devices[0].fRecord, "OtherIdentifyingInfo"), "{ usbhid, 100mA }");
   EXPECT_EQ(devices[1].fName, "usb1");
   EXPECT_EQ(devices[1].fHub, "");
   EXPECT_EQ(devices[1].fController, "0000:00:01.0");
