@@ -168,7 +168,7 @@ TRecord AnyDriveRecord(char const* className, TMachineFiles const& files, TDisk 
       .Names(kOperationalStatusNames);
   record.Add("StatusDescriptions", status.Then([](TStatus const& values) { return values.fTexts; }));
   record.Add("Capabilities", CapabilitiesOf(files, device)).Names(kCapabilitiesNames);
-  record.Add("MaxMediaSize", MediaSizeOf(files, device));
+  record.Add("MaxMediaSize", MediaSizeOf(files, device)).Unit("byte * 10^3");
   record.Add("DefaultBlockSize", files.Number<unsigned long>(device.File("queue/logical_block_size"))).Unit("byte");
   return record;
 }
@@ -192,7 +192,7 @@ TRecord DiskDriveRecord(TMachineFiles const& files, TDisk const& disk, TSmartRep
   record.Add("InterconnectType", transport.Then([](auto const& name) { return InterconnectOf(name).fType; }))
       .Names(kInterconnectTypeNames);
   record.Add("OtherInterconnectType", transport.Then(OtherInterconnectOf));
-  record.Add("InterconnectSpeed", disk.fAttachment.fSpeed);
+  record.Add("InterconnectSpeed", disk.fAttachment.fSpeed).Unit("bit / second");
   return record;
 }
 

@@ -130,7 +130,7 @@ TRecord ExtentRecord(char const* className, TMachineFiles const& files, TBlockDe
   system.AddDeviceKeys(record, device.fName);
   record.Add("Name", TText(device.Node()));
   record.Add("ElementName", elementName);
-  record.Add("BlockSize", BlockSizeOf(files, device));
+  record.Add("BlockSize", BlockSizeOf(files, device)).Unit("byte");
   record.Add("NumberOfBlocks", BlocksOf(files, device));
   record.Add("Access", AccessOf(files, device)).Names(kAccessNames);
   record.Add("Primordial", TFinding<bool>(device.IsDrive()));
@@ -159,10 +159,12 @@ TRecord PartitionRecord(TMachineFiles const& files, TPartition const& partition,
 
 TRecord BasedOnRecord(TNumber const& start, TNumber const& size, unsigned short order) {
   TRecord record("CIM_BasedOn", "sysfs");
-  record.Add("StartingAddress", start);
-  record.Add("EndingAddress", size.Then([&](unsigned long length) -> TNumber {
-    return start.Then([&](unsigned long begin) { return begin + length - 1; });
-  }));
+  record.Add("StartingAddress", start).Unit("byte");
+  record
+      .Add("EndingAddress", size.Then([&](unsigned long length) -> TNumber {
+        return start.Then([&](unsigned long begin) { return begin + length - 1; });
+      }))
+      .Unit("byte");
   record.Add("OrderIndex", TCode(order));
   return record;
 }

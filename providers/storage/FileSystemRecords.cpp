@@ -85,7 +85,7 @@ TRecord FileSystemRecord(char const* className, TFileSystem const& fileSystem, T
   record.Add("PersistenceType", TFinding<unsigned short>(PersistenceOf(fileSystem))).Names(kPersistenceTypeNames);
   record.SetSource("statvfs");
   record.Add("BlockSize", NumberOf(use, &TFileSystemUse::fBlockSize)).Unit("byte");
-  record.Add("ClusterSize", SmallNumberOf(use, &TFileSystemUse::fFragmentSize));
+  record.Add("ClusterSize", SmallNumberOf(use, &TFileSystemUse::fFragmentSize)).Unit("byte");
   record.Add("FileSystemSize", NumberOf(use, &TFileSystemUse::fSize)).Unit("byte");
   record.Add("AvailableSpace", NumberOf(use, &TFileSystemUse::fAvailable)).Unit("byte");
   record.Add("MaxFileNameLength", SmallNumberOf(use, &TFileSystemUse::fMaxNameLength));

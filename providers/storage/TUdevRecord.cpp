@@ -43,6 +43,17 @@ TUdevRecord TUdevRecord::From(std::string const& text) {
   return record;
 }
 
+TUdevRecord TUdevRecord::FromBlkid(std::string const& text) {
+  if (text.empty())
+    return TUdevRecord(TMissing{kMissingNotGiven, "without udev: blkid found nothing on this device, or could not read it"});
+  std::istringstream lines(text);
+  std::string properties;
+  for (std::string line; std::getline(lines, line);) properties += "E:" + line + "\n";
+  TUdevRecord record = From(properties);
+  record.fOrigin = "the output of blkid";
+  return record;
+}
+
 TUdevRecord TUdevRecord::Of(TMachineFiles const& files, TFinding<std::string> const& number) {
   if (!number) return TUdevRecord(number.Why());
   auto const text = files.Content("/run/udev/data/b" + *number);
@@ -53,21 +64,21 @@ TFinding<std::string> TUdevRecord::Value(std::string const& name) const {
   if (!Exists()) return fWhy;
   auto const found = fValues.find(name);
   std::string const value = found == fValues.end() ? "" : WithoutOuterBlanks(found->second);
-  if (value.empty()) return TMissing{kMissingNotGiven, "the udev database has no " + name + " of this device"};
+  if (value.empty()) return TMissing{kMissingNotGiven, fOrigin + " has no " + name + " of this device"};
   return value;
 }
 
 TFinding<std::string> TUdevRecord::DecodedValue(std::string const& name) const {
   return Value(name).Then([&](std::string const& value) -> TFinding<std::string> {
     std::string const decoded = WithoutOuterBlanks(Decoded(value));
-    if (decoded.empty()) return TMissing{kMissingNotGiven, "the udev database has only blanks as " + name + " of this device"};
+    if (decoded.empty()) return TMissing{kMissingNotGiven, fOrigin + " has only blanks as " + name + " of this device"};
     return decoded;
   });
 }
 
 TFinding<std::vector<std::string>> TUdevRecord::Links() const {
   if (!Exists()) return fWhy;
-  if (fLinks.empty()) return TMissing{kMissingNotGiven, "udev made no links to the node"};
+  if (fLinks.empty()) return TMissing{kMissingNotGiven, "no links to the node are known"};
   return fLinks;
 }
 

@@ -21,10 +21,14 @@ public:
   // are malformed, are ignored.
   static TUdevRecord From(std::string const& text);
 
+  // `text`: the output of blkid -o udev, whose lines are the same properties without "E:". There are no links. An
+  // empty text is a missing record.
+  static TUdevRecord FromBlkid(std::string const& text);
+
   // The record of the block device with that number, "8:1".
   static TUdevRecord Of(TMachineFiles const& files, TFinding<std::string> const& number);
 
-  // Whether udev, or libblkid in its place, knows the device.
+  // Whether udev, or blkid in its place, knows the device.
   bool Exists() const { return fWhy.fCode.empty(); }
 
   // A property, without outer blanks. Missing if the record is, or has no such property, or an empty one.
@@ -40,6 +44,7 @@ private:
   std::map<std::string, std::string> fValues;
   std::vector<std::string> fLinks;
   TMissing fWhy;  // empty for a record that exists
+  std::string fOrigin = "the udev database";
 };
 
 }  // namespace NQRVZEP20

@@ -60,6 +60,20 @@ TEST_F(StorageNamespaceTest, AssociationsLeadFromAPartitionToTheController) {
   EXPECT_THAT(Values("CIM_ControlledBy", "Dependent"), ElementsAre(HasSubstr("DeviceID=\"sda\"")));
 }
 
+TEST_F(StorageNamespaceTest, WithoutUdevTheContentIsThatOfBlkid) {
+  std::string const device = "/sys/devices/pci0000:00/0000:00:1f.2/host0/target0:0:0/0:0:0:0";
+  fTree.AddDisk(device, "sda", "8:0", "2048");
+  fTree.AddPartition(device + "/block/sda", "sda1", "8:1", "34", "1000");
+  fTree.AddPartition(device + "/block/sda", "sda2", "8:2", "1034", "1000");
+  fTree.Add("/zep-answers/blkid/sda1", "ID_FS_TYPE=xfs\nID_FS_USAGE=filesystem\nID_PART_ENTRY_SCHEME=gpt\n");
+  fTree.Add("/zep-answers/blkid/sda2", "ID_FS_TYPE=ext4\nID_FS_USAGE=filesystem\n");
+  fTree.Add("/run/udev/data/b8:2", "E:ID_FS_TYPE=swap\n");
+  Fill();
+  EXPECT_THAT(Values("CIM_GPTDiskPartition", "DeviceID"), ElementsAre("sda1"));
+  EXPECT_THAT(Values("CIM_FileSystem", "Name"), ElementsAre("/dev/sda1"));
+  EXPECT_THAT(Values("CIM_ResidesOnExtent", "Antecedent"), ElementsAre(HasSubstr("DeviceID=\"sda1\"")));
+}
+
 // tests/data/storage/NAME.txt has the complete text. To renew it after a change: ZEP_RENEW_TEXTS=1 storage_tests.
 TEST_F(StorageNamespaceTest, RecordedMachinesAreDescribedCompletely) {
   for (std::string const name : {"server", "degraded"}) {

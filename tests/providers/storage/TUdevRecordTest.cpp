@@ -31,6 +31,15 @@ TEST(TUdevRecordTest, OnlyCompleteEscapesAreDecoded) {
     EXPECT_EQ(TextOf(TUdevRecord::From("E:X=" + std::string(row.fText)).DecodedValue("X")), row.fDecoded) << row.fText;
 }
 
+TEST(TUdevRecordTest, TheOutputOfBlkidHasTheSameProperties) {
+  TUdevRecord const record = TUdevRecord::FromBlkid("ID_FS_TYPE=ext4\nID_FS_LABEL_ENC=a\\x20b\n");
+  EXPECT_EQ(TextOf(record.Value("ID_FS_TYPE")), "ext4");
+  EXPECT_EQ(TextOf(record.DecodedValue("ID_FS_LABEL_ENC")), "a b");
+  EXPECT_EQ(TextOf(record.Value("ID_FS_UUID")), "<the output of blkid has no ID_FS_UUID of this device>");
+  EXPECT_EQ(TextOf(TUdevRecord::FromBlkid("").Value("ID_FS_TYPE")),
+            "<without udev: blkid found nothing on this device, or could not read it>");
+}
+
 TEST(TUdevRecordTest, MalformedLinesAreIgnored) {
   TUdevRecord const record = TUdevRecord::From("E:\nE\nE:=\nS:\n\n=\nE:A");
   EXPECT_TRUE(record.Exists());
