@@ -16,7 +16,7 @@ using TText = TFinding<std::string>;
 
 std::string const kDevices = "/sys/bus/pci/devices/";
 std::string const kSlots = "/sys/bus/pci/slots/";
-constexpr std::size_t kConfigurationLimit = 4096;
+constexpr std::size_t kHeaderSize = 64;  // of the configuration space
 constexpr std::uint32_t kClassOfBridges = 0x06;
 constexpr unsigned kPciBridge = 0x04;  // a subclass
 
@@ -26,7 +26,8 @@ TMissing Unread() { return {kMissingNotDescribed, "not read"}; }
 class TPciFiles {
 public:
   TPciFiles() : fFiles(nullptr) {}
-  TPciFiles(TMachineFiles const& files, std::string const& name) : fFiles(&files), fDirectory(kDevices + name + "/") {}
+  TPciFiles(TMachineFiles const& files, std::string const& name)
+      : fFiles(&files), fDirectory(kDevices + name + "/"), fConfiguration(files.Beginning(fDirectory + "config", kHeaderSize)) {}
 
   template <class T>
   TFinding<T> Number(char const* file) const {
@@ -41,11 +42,10 @@ public:
     if (fFiles == nullptr) return Unread();
     return fFiles->RealName(fDirectory + file);
   }
-  // A little-endian number in the first 64 bytes of the configuration space, which every user may read.
+  // A little-endian number in the header of the configuration space, which every user may read.
   template <class T>
   TFinding<T> Configuration(std::size_t offset) const {
-    if (fFiles == nullptr) return Unread();
-    return fFiles->Content(fDirectory + "config", kConfigurationLimit).Then([&](std::string const& bytes) -> TFinding<T> {
+    return fConfiguration.Then([&](std::string const& bytes) -> TFinding<T> {
       if (bytes.size() < offset + sizeof(T)) return TMissing{kMissingUnreadable, "the configuration space is cut off"};
       T number = 0;
       for (std::size_t at = sizeof(T); at-- > 0;)
@@ -58,6 +58,7 @@ public:
 private:
   TMachineFiles const* fFiles;
   std::string fDirectory;
+  TFinding<std::string> fConfiguration = Unread();
 };
 
 TFinding<TPciNumbers> NumbersOf(TPciFiles const& function) {

@@ -66,12 +66,11 @@ bool IsRegularFile(int fd) {
   return ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode);
 }
 
-// Reads up to the end of the file, or a little more than `limit` bytes. Returns false and leaves the reason in errno when
-// reading fails.
-bool ReadAll(int fd, std::size_t limit, std::string& content) {
+// Reads up to `limit` bytes, or to the end of the file. Returns false and leaves the reason in errno when reading fails.
+bool ReadUpTo(int fd, std::size_t limit, std::string& content) {
   char buffer[4096];
-  while (content.size() <= limit) {
-    ssize_t const count = ::read(fd, buffer, sizeof buffer);
+  while (content.size() < limit) {
+    ssize_t const count = ::read(fd, buffer, std::min(sizeof buffer, limit - content.size()));
     if (count == 0) return true;
     if (count > 0)
       content.append(buffer, static_cast<std::size_t>(count));
@@ -114,12 +113,18 @@ TMachineFiles::TMachineFiles(std::string root) : fRoot(std::move(root)) {
 }
 
 TFinding<std::string> TMachineFiles::Content(std::string const& path, std::size_t limit) const {
+  return Beginning(path, limit + 1).Then([&](std::string const& content) -> TFinding<std::string> {
+    if (content.size() <= limit) return content;
+    return TMissing{kMissingUnreadable, path + " is longer than " + std::to_string(limit) + " bytes"};
+  });
+}
+
+TFinding<std::string> TMachineFiles::Beginning(std::string const& path, std::size_t length) const {
   TFd const file = OpenBelow(fRoot, path, O_RDONLY);
   if (!file) return WhyUnreadable(path, errno);
   if (!IsRegularFile(file.Get())) return TMissing{kMissingUnreadable, path + " is not a regular file"};
   std::string content;
-  if (!ReadAll(file.Get(), limit, content)) return WhyUnreadable(path, errno);
-  if (content.size() > limit) return TMissing{kMissingUnreadable, path + " is longer than " + std::to_string(limit) + " bytes"};
+  if (!ReadUpTo(file.Get(), length, content)) return WhyUnreadable(path, errno);
   return content;
 }
 

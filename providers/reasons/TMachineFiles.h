@@ -35,6 +35,10 @@ public:
   // `limit` bytes.
   TFinding<std::string> Content(std::string const& path, std::size_t limit = std::size_t(1) << 20) const;
 
+  // The first `length` bytes; fewer if the file is shorter. Nothing after them is read, because some files of sysfs are slow:
+  // each byte of a PCI configuration space is a query of the device. Missing like Content, but a file may be longer.
+  TFinding<std::string> Beginning(std::string const& path, std::size_t length) const;
+
   // The first line, without blanks at either end. Missing like Content, and if the line is empty.
   TFinding<std::string> Line(std::string const& path) const;
 

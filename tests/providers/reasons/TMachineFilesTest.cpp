@@ -73,6 +73,13 @@ TEST_F(TMachineFilesTest, AFileOfExactlyTheLimitIsRead) {
   EXPECT_EQ(Shown(fFiles.Content("/file", 9999)), "unreadable: /file is longer than 9999 bytes");
 }
 
+TEST_F(TMachineFilesTest, TheBeginningOfAFileMayBeRead) {
+  Write("/file", "0123456789");
+  EXPECT_EQ(Shown(fFiles.Beginning("/file", 4)), "0123");
+  EXPECT_EQ(Shown(fFiles.Beginning("/file", 11)), "0123456789");
+  EXPECT_EQ(Shown(fFiles.Beginning("/none", 4)), "not-given: /none does not exist");
+}
+
 TEST_F(TMachineFilesTest, AFileOfRootNamesRoot) {
   NEEDS(::geteuid() == 0, "root, to become another user");
   Write("/secret", "x");
