@@ -76,11 +76,13 @@ struct TIdentifiers {
   }
 };
 
-TIdentifiers IdentifiersOf(TDisk const& disk) {
+TIdentifiers IdentifiersOf(TMachineFiles const& files, TDisk const& disk) {
   TIdentifiers identifiers;
   for (TDesignator const& designator : disk.fDesignators) identifiers.Add(designator.fText, designator.fFormat);
   identifiers.Add(disk.fSerialNumber, "Serial number");
   identifiers.Add(disk.fAttachment.ScsiAddress(), "SCSI address");
+  identifiers.Add(files.Line(disk.fDevice.File("device/subsysnqn")), "NVMe qualified name");
+  identifiers.Add(files.RealName(disk.fDevice.File("device/driver")), "Driver");
   return identifiers;
 }
 
@@ -156,7 +158,7 @@ TText OtherInterconnectOf(std::string const& transport) {
 // The properties of drives of all kinds.
 TRecord AnyDriveRecord(char const* className, TMachineFiles const& files, TDisk const& disk, TFinding<TStatus> const& status,
                        TComputerSystem const& system) {
-  TIdentifiers const identifiers = IdentifiersOf(disk);
+  TIdentifiers const identifiers = IdentifiersOf(files, disk);
   TBlockDevice const& device = disk.fDevice;
   TRecord record(className, kSource);
   system.AddDeviceKeys(record, device.fName);
