@@ -19,6 +19,9 @@ using TText = TFinding<std::string>;
 std::string const kDevices = "/sys/bus/usb/devices/";
 constexpr std::uint8_t kClassOfHubs = 9;
 
+// "1-2:1.0" is an interface of the device 1-2; devices and files have no colon in their names.
+bool IsInterface(std::string const& name) { return name.find(':') != std::string::npos; }
+
 // The files of a device, or nothing for a record that only declares its class.
 class TUsbFiles {
 public:
@@ -35,12 +38,12 @@ public:
     return Number<T>(file, 10);
   }
 
-  // The drivers of the device's interfaces, each once. `name`: that of the device.
-  std::vector<std::string> Drivers(std::string const& name) const {
+  // The drivers of the device's interfaces, each once.
+  std::vector<std::string> Drivers() const {
     std::vector<std::string> drivers;
     if (fFiles == nullptr) return drivers;
     for (std::string const& entry : fFiles->Names(fDirectory)) {
-      if (entry.compare(0, name.size() + 1, name + ":") != 0) continue;
+      if (!IsInterface(entry)) continue;
       auto const driver = fFiles->RealName(fDirectory + entry + "/driver");
       if (driver && std::find(drivers.begin(), drivers.end(), *driver) == drivers.end()) drivers.push_back(*driver);
     }
@@ -93,7 +96,7 @@ TRecord DeviceRecord(char const* className, TComputerSystem const& system, std::
   record.Add("NumberOfConfigs", device.Decimal<std::uint8_t>("bNumConfigurations"));
   record.Add("CurrentConfigValue", device.Decimal<std::uint8_t>("bConfigurationValue"));
   TIdentifiers identifiers;
-  for (std::string const& driver : device.Drivers(name)) identifiers.Add("Driver", driver);
+  for (std::string const& driver : device.Drivers()) identifiers.Add("Driver", driver);
   identifiers.Add("Maximum power", device.Line("bMaxPower"));
   identifiers.AddTo(record);
   return record;
@@ -120,7 +123,6 @@ std::string ControllerIn(std::vector<std::string> const& namesAbove) {
   return found != namesAbove.end() ? *found : "";
 }
 
-bool IsInterface(std::string const& name) { return name.find(':') != std::string::npos; }
 bool IsRootHub(std::string const& name) { return name.compare(0, 3, "usb") == 0; }
 
 }  // namespace
