@@ -190,7 +190,7 @@ bool IsBelow(boost::shared_ptr<ICIMClass const> cls, std::string const& name) {
   return false;
 }
 
-// The identity, the details and the sections show these, and nobody looks for the others by themselves.
+// Classes that the identity, the details or a section shows, and associations.
 bool IsShownElsewhere(boost::shared_ptr<ICIMClass const> const& cls) {
   std::set<std::string> const shown = {TCIMSchemaHelper::kSystemCreationClassName,
                                        TCIMSchemaHelper::kOperatingSystemCreationClassName, "QRVSG_ZEPProduct",

@@ -15,8 +15,7 @@ public:
     int const status = std::system(("tar -C '" + fDir.Path() + "' -xzf '" + archive + "'").c_str());
     EXPECT_EQ(status, 0) << archive << " cannot be unpacked";
     std::string const answers = TestDataPath("machines/" + name);
-    if (std::filesystem::exists(answers))
-      std::filesystem::copy(answers, fDir.Path(), std::filesystem::copy_options::recursive);
+    if (std::filesystem::exists(answers)) std::filesystem::copy(answers, fDir.Path(), std::filesystem::copy_options::recursive);
   }
 
   // A directory for ZEP_ROOT.

@@ -107,8 +107,7 @@ void TRecordWriter::Associate(TAssociation const& association, TRecord const& fi
   Associate(association, first, second, TRecord(association.fClassName, ""));
 }
 
-void TRecordWriter::Associate(TAssociation const& association, TRecord const& first, TRecord const& second,
-                              TRecord const& more) {
+void TRecordWriter::Associate(TAssociation const& association, TRecord const& first, TRecord const& second, TRecord const& more) {
   if (!HasClass(association.fClassName) || fWithoutRecords.count(association.fClassName) > 0)
     DeclareAssociation(association, more);
   AddInstance(more, {{association.fFirstName, ReferenceTo(first)}, {association.fSecondName, ReferenceTo(second)}});

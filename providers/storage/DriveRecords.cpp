@@ -111,7 +111,7 @@ bool IsVirtual(TDisk const& disk) {
 }
 
 TCode DiskTypeOf(TMachineFiles const& files, TDisk const& disk, TFinding<unsigned> const& rotations) {
-  if (IsVirtual(disk)) return TMissing{kMissingNotApplicable, "the kernel does not know the medium behind a virtual disk"};
+  if (IsVirtual(disk)) return TMissing{kMissingNotApplicable, "the kernel does not know which medium a virtual disk uses"};
   if (rotations) return *rotations == 0 ? kSolidState : kHardDisk;
   return files.Number<int>(disk.fDevice.File("queue/rotational")).Then([](int isRotating) {
     return isRotating != 0 ? kHardDisk : kSolidState;

@@ -109,7 +109,7 @@ TRecord LocalFileSystemRecord(TMachineFiles const& files, TFileSystem const& fil
 
 TRecord RemoteFileSystemRecord(TFileSystem const& fileSystem, TRecord const& system) {
   TMissing const notAsked{kMissingUnreadable,
-                          "a query would wait as long as the server or the program behind this file system does not answer"};
+                          "a query would wait until the server or program that provides this file system answers"};
   return FileSystemRecord("CIM_RemoteFileSystem", fileSystem, notAsked, system);
 }
 

@@ -51,7 +51,7 @@ TEST_F(FileSystemRecordsTest, ARemoteFileSystemIsNotAsked) {
   EXPECT_EQ(LineOf(record, "Name"), "server:/x on /data");
   EXPECT_EQ(LineOf(record, "PersistenceType"), "4");
   EXPECT_EQ(LineOf(record, "FileSystemSize"),
-            "<a query would wait as long as the server or the program behind this file system does not answer>");
+            "<a query would wait until the server or program that provides this file system answers>");
 }
 
 TEST_F(FileSystemRecordsTest, Mount) {
