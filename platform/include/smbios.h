@@ -8,9 +8,10 @@
  *
  * The tables are those that the kernel exports (/sys/firmware/dmi/tables/DMI, which only root may read), or those in the file
  * that the environment variable ZEP_SMBIOS_TABLE names: a bare DMI table, or a dump as `dmidecode --dump-bin` writes it, with
- * an entry point of any form ("_SM3_", "_SM_", "_DMI_"). Each smBiosLoad reads the variable; the file read last is not
- * read again while it is unchanged. A table ends at its end-of-table structure (type 127), or before the first
- * incomplete structure; no more than the first 16 MiB of a file are read.
+ * an entry point of any form ("_SM3_", "_SM_", "_DMI_"). If only ZEP_ROOT is set, the kernel's file is the one below the
+ * directory that it names. Each smBiosLoad reads the variables; the file read last is not read again while it is unchanged.
+ * A table ends at its end-of-table structure (type 127), or before the first incomplete structure; no more than the first
+ * 16 MiB of a file are read.
  *
  * A handle holds a copy of the tables and is used by one thread at a time; any number may be open.
  */

@@ -25,7 +25,7 @@
 
 namespace {
 
-constexpr char const* kKernelTable = "/sys/firmware/dmi/tables/DMI";
+constexpr char const* kKernelTable = "/sys/firmware/dmi/tables/DMI";  // below the root
 constexpr std::size_t kMaxFileSize = 16u << 20;
 
 // The contents of a file, and the table in them.
@@ -41,9 +41,15 @@ struct THandle {
   smbios::TStructureReader fPlace;
 };
 
-char const* TablePath() {
-  char const* named = std::getenv("ZEP_SMBIOS_TABLE");
-  return named != nullptr && *named != '\0' ? named : kKernelTable;
+// The value of an environment variable; empty when it is not set.
+std::string Variable(char const* name) {
+  char const* const value = std::getenv(name);
+  return value != nullptr ? value : "";
+}
+
+std::string TablePath() {
+  std::string const named = Variable("ZEP_SMBIOS_TABLE");
+  return named.empty() ? Variable("ZEP_ROOT") + kKernelTable : named;
 }
 
 int StatusOfOpenError(int error) {
@@ -122,7 +128,7 @@ int ReadTableFile(char const* path, TSharedTableFile& tableFile) {
 
 int Load(void** handle) {
   auto loaded = std::make_unique<THandle>();
-  if (int const status = ReadTableFile(TablePath(), loaded->fFile); status != kSmbiosOk) return status;
+  if (int const status = ReadTableFile(TablePath().c_str(), loaded->fFile); status != kSmbiosOk) return status;
   if (loaded->fFile->fTable.empty()) return kSmbiosFail;
   loaded->fPlace = smbios::TStructureReader(loaded->fFile->fTable);
   *handle = loaded.release();

@@ -1,69 +1,134 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "HostNamespace.h"
 
+#include "BoardInstances.h"
+#include "BootRecords.h"
+#include "HostContext.h"
 #include "HostRecords.h"
+#include "MemoryInstances.h"
+#include "Placeholder.h"
+#include "ProcessorInstances.h"
+#include "RunningRecords.h"
 #include "ScsiRecords.h"
 #include "SmbiosRecords.h"
-#include "TSmbiosReader.h"
+#include "Virtualization.h"
 #include "providers/memory/TMemoryNamespace.h"
 #include "providers/reasons/TRecordWriter.h"
-
-#include <sys/utsname.h>
 
 namespace NQRVZEP20 {
 
 namespace {
 
-utsname Kernel() {
-  utsname kernel = {};
-  ::uname(&kernel);
-  return kernel;
+constexpr TAssociation kRunningOS{"CIM_RunningOS", "Antecedent", "CIM_OperatingSystem", "Dependent", "CIM_ComputerSystem"};
+constexpr TAssociation kSystemBios{"CIM_SystemBIOS", "GroupComponent", "CIM_ComputerSystem", "PartComponent", "CIM_BIOSElement"};
+constexpr TAssociation kSystemPackage{"CIM_ComputerSystemPackage", "Antecedent", "CIM_PhysicalPackage", "Dependent",
+                                      "CIM_ComputerSystem"};
+
+constexpr TAssociation kSettings{"CIM_ElementSettingData", "ManagedElement", "CIM_ManagedElement", "SettingData",
+                                 "CIM_SettingData"};
+constexpr TAssociation kStatistics{"CIM_ElementStatisticalData", "ManagedElement", "CIM_ManagedElement", "Stats",
+                                   "CIM_StatisticalData"};
+
+// The strings of the manufacturer and of the system's options, with the kind of each.
+TIdentifyingTexts StringsOf(TSmbiosReader const& tables) {
+  TIdentifyingTexts texts{tables.SourceOf(kSmbiosOemStrings) + ", " + tables.SourceOf(kSmbiosOptions), {}};
+  constexpr struct {
+    int fType;
+    char const* fKind;
+  } kinds[] = {{kSmbiosOemStrings, "OEM string"}, {kSmbiosOptions, "Configuration option"}};
+  for (auto const& [type, kind] : kinds)
+    for (TSmbiosStructure const& structure : tables.All(type))
+      for (std::string const& text : structure.Texts())
+        if (auto const found = WithoutPlaceholder(text)) texts.fTexts.emplace_back(kind, *found);
+  return texts;
 }
 
-// Writes a class with a record of each structure of that type that is `isPresent`. `makeRecord` gets a structure and its number.
-template <class TMakeRecord, class TIsPresent>
-void WriteEach(TRecordWriter& writer, TSmbiosReader const& tables, int type, TIsPresent isPresent,
-               std::string const& whyNoneIsPresent, TMakeRecord makeRecord) {
-  std::vector<TSmbiosStructure> const structures = tables.All(type);
-  std::vector<TRecord> records;
-  for (TSmbiosStructure const& structure : structures)
-    if (isPresent(structure)) records.push_back(makeRecord(structure, static_cast<unsigned>(records.size())));
-
-  TMissing const whyNone = structures.empty() ? tables.WhyNone(type) : TMissing{kMissingNotGiven, whyNoneIsPresent};
-  writer.Write(makeRecord(TSmbiosStructure(whyNone), 0), records, whyNone);
+// The kernel describes this machine. Tables from a file that the user names may be those of another one, and facts of two
+// machines must not be mixed.
+TFinding<TMachineFiles> HardwareFiles(TMachineFiles const& files, TSmbiosReader const& tables) {
+  if (files.IsThisMachine() && tables.IsOfNamedFile())
+    return TMissing{kMissingNotGiven,
+                    "the SMBIOS tables are read from a named file, so this machine's own hardware is not described"};
+  return files;
 }
 
-bool Always(TSmbiosStructure const&) { return true; }
+void WriteOperatingSystem(THostContext const& host, TKernelNames const& kernel) {
+  TMemInfo const memory = TMemInfo::ReadFrom(host.fFiles, "/proc/meminfo");
+  TRecord const system = OperatingSystemRecord(TOsRelease::ReadFrom(host.fFiles), kernel, memory, host.fFiles, host.fName);
+  TRecord const state = RunningRecord(host.fFiles, memory);
+  host.fWriter.Write(system);
+  host.fWriter.Write(state);
+  host.fWriter.Associate(kRunningOS, system, host.fSystem);
+  host.fWriter.Associate(kStatistics, system, state);
+}
+
+void WriteBios(THostContext const& host) {
+  auto const records = WriteEach(host, kSmbiosBios, IsAlwaysPresent, "", [&](TSmbiosStructure const& bios, unsigned number) {
+    return BiosRecord(bios, host.fTables.SourceOf(kSmbiosBios), number);
+  });
+  for (TStructureRecord const& bios : records) host.fWriter.Associate(kSystemBios, host.fSystem, bios.fRecord);
+}
+
+void WriteChassis(THostContext const& host) {
+  auto const records =
+      WriteEach(host, kSmbiosChassis, IsAlwaysPresent, "", [&](TSmbiosStructure const& chassis, unsigned number) {
+        return ChassisRecord(chassis, host.fTables.SourceOf(kSmbiosChassis), number);
+      });
+  for (TStructureRecord const& chassis : records) host.fWriter.Associate(kSystemPackage, chassis.fRecord, host.fSystem);
+}
+
+// Writes an instance with the settings of the computer system; none when the hardware is that of another machine.
+template <class TMakeRecord>
+void WriteSettings(THostContext const& host, TMakeRecord makeRecord) {
+  bool const isDescribed = static_cast<bool>(host.fHardwareFiles);
+  TRecord const record = makeRecord(host.fFiles);
+  host.fWriter.Write(record, isDescribed ? std::vector<TRecord>{record} : std::vector<TRecord>(),
+                     isDescribed ? TMissing() : host.fHardwareFiles.Why());
+  if (isDescribed) host.fWriter.Associate(kSettings, host.fSystem, record);
+}
+
+void WriteFirmware(THostContext const& host, TFinding<TKernelProcessors> const& processors) {
+  WriteSettings(host, [&](TMachineFiles const& files) {
+    return BootRecord(files, host.fTables.First(kSmbiosBoot), host.fTables.SourceOf(kSmbiosBoot));
+  });
+  WriteSettings(host, [&](TMachineFiles const& files) { return VirtualizationRecord(files, processors); });
+
+  auto const& files = host.fHardwareFiles;
+  auto const modules = files ? TpmRecords(*files, host.fName) : std::vector<TRecord>();
+  host.fWriter.Write(
+      TpmShape(host.fName), modules,
+      files ? TMissing{kMissingNotGiven, "the kernel lists no trusted platform module in /sys/class/tpm"} : files.Why());
+  for (TRecord const& module : modules) host.fWriter.Associate(kSystemDevice, host.fSystem, module);
+}
+
+void WriteScsiDevices(THostContext const& host) {
+  std::string const directory = ScsiDirectory(host.fFiles);
+  auto const devices = ScsiRecords(directory, host.fName);
+  host.fWriter.Write(ScsiShape(host.fName), devices, WhyNoScsiDevices(directory));
+  for (TRecord const& device : devices) host.fWriter.Associate(kSystemDevice, host.fSystem, device);
+}
 
 }  // namespace
 
 void FillHostNamespace(TMemoryNamespace& ns) {
-  TRecordWriter writer(ns);
-
-  utsname const kernel = Kernel();
+  TMachineFiles const files = TMachineFiles::OfThisProcess();
+  TKernelNames const kernel = KernelNamesOf(files);
   TSystemName const name = SystemNameOf(kernel);
-  TSmbiosReader const tables;
-  writer.Write(ComputerSystemRecord(tables.First(kSmbiosSystem), tables.SourceOf(kSmbiosSystem), name, tables.Version()));
-  writer.Write(OperatingSystemRecord(TOsRelease::OfThisMachine(), kernel, name));
+  TSmbiosReader const tables(files);
+  TRecord const system = ComputerSystemRecord(tables.First(kSmbiosSystem), tables.SourceOf(kSmbiosSystem), name, tables.Version(),
+                                              StringsOf(tables));
+
+  TRecordWriter writer(ns);
+  THostContext const host{writer, tables, files, HardwareFiles(files, tables), name, system};
+  writer.Write(system);
+  WriteOperatingSystem(host, kernel);
   writer.Write(ProductRecord());
-
-  WriteEach(writer, tables, kSmbiosBios, Always, "", [&](TSmbiosStructure const& bios, unsigned number) {
-    return BiosRecord(bios, tables.SourceOf(kSmbiosBios), number);
-  });
-  WriteEach(writer, tables, kSmbiosChassis, Always, "", [&](TSmbiosStructure const& chassis, unsigned number) {
-    return ChassisRecord(chassis, tables.SourceOf(kSmbiosChassis), number);
-  });
-  WriteEach(writer, tables, kSmbiosProcessor, IsSocketFilled, "the firmware reports every processor socket as empty",
-            [&](TSmbiosStructure const& processor, unsigned number) {
-              return ProcessorRecord(processor, tables.SourceOf(kSmbiosProcessor), number, name);
-            });
-  WriteEach(writer, tables, kSmbiosMemoryDevice, IsSlotFilled, "the firmware reports every memory slot as empty",
-            [&](TSmbiosStructure const& memoryDevice, unsigned number) {
-              return MemoryRecord(memoryDevice, tables.SourceOf(kSmbiosMemoryDevice), number);
-            });
-
-  std::string const scsi = ScsiDirectory();
-  writer.Write(ScsiShape(name), ScsiRecords(scsi, name), WhyNoScsiDevices(scsi));
+  WriteBios(host);
+  WriteChassis(host);
+  auto const processors = WriteProcessors(host);
+  WriteBoards(host, WriteMemory(host, processors));
+  WriteFirmware(host, processors.fKernel);
+  WriteScsiDevices(host);
   writer.WriteMissing();
 }
 

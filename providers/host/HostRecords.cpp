@@ -1,12 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "HostRecords.h"
 
-#include "Placeholder.h"
+#include "RunningClock.h"
 #include "TCIMSchemaHelper.h"
 
-#include <sys/utsname.h>
-
-#include <cstdlib>
+#include <algorithm>
 
 namespace NQRVZEP20 {
 
@@ -14,17 +12,38 @@ namespace {
 
 using TText = TFinding<std::string>;
 
-TText KernelText(char const* text) { return std::string(text); }
+bool IsNumber(std::string const& name) { return name.find_first_not_of("0123456789") == std::string::npos; }
+
+// Each process has a directory in /proc, which a recorded machine lacks.
+TFinding<std::uint32_t> NumberOfProcesses(TMachineFiles const& files) {
+  auto const names = files.Names("/proc");
+  auto const count = std::count_if(names.begin(), names.end(), IsNumber);
+  if (count == 0) return TMissing{kMissingNotGiven, "/proc lists no processes"};
+  return static_cast<std::uint32_t>(count);
+}
+
+TFinding<std::uint64_t> Sum(TFinding<std::uint64_t> const& one, TFinding<std::uint64_t> const& other) {
+  return one.Then([&](std::uint64_t first) { return other.Then([first](std::uint64_t second) { return first + second; }); });
+}
+
+// In units of 1024 bytes, like the file. The schema calls the memory together with the swap space virtual memory.
+void AddMemory(TRecord& record, TMemInfo const& memory) {
+  constexpr char const* unit = "byte * 2^10";
+  auto const total = memory.Kilobytes("MemTotal"), free = memory.Kilobytes("MemFree");
+  auto const swap = memory.Kilobytes("SwapTotal"), freeSwap = memory.Kilobytes("SwapFree");
+  record.SetSource("/proc/meminfo");
+  record.Add("TotalVisibleMemorySize", total).Unit(unit);
+  record.Add("FreePhysicalMemory", free).Unit(unit);
+  record.Add("TotalSwapSpaceSize", swap).Unit(unit);
+  record.Add("FreeSpaceInPagingFiles", freeSwap).Unit(unit);
+  record.Add("TotalVirtualMemorySize", Sum(total, swap)).Unit(unit);
+  record.Add("FreeVirtualMemory", Sum(free, freeSwap)).Unit(unit);
+}
 
 }  // namespace
 
-TSystemName SystemNameOf(utsname const& kernel) {
-  char const* named = std::getenv("ZEP_HOST_NAME");
-  if (named != nullptr && *named != '\0') return {named, "ZEP_HOST_NAME"};
-  return {HostNameOf(kernel.nodename), "uname"};
-}
-
-TRecord OperatingSystemRecord(TOsRelease const& release, utsname const& kernel, TSystemName const& name) {
+TRecord OperatingSystemRecord(TOsRelease const& release, TKernelNames const& kernel, TMemInfo const& memory,
+                              TMachineFiles const& files, TSystemName const& name) {
   TRecord record(TCIMSchemaHelper::kOperatingSystemCreationClassName, release.GetFile(), "CIM_OperatingSystem");
   record.AddKey("CSCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
   record.AddPropagatedKey("CSName", name.fName);
@@ -33,11 +52,20 @@ TRecord OperatingSystemRecord(TOsRelease const& release, utsname const& kernel, 
   record.Add("Caption", release.Value({"PRETTY_NAME"}));
   record.Add("Version", release.Value({"VERSION", "VERSION_ID", "BUILD_ID"}));
 
-  record.SetSource("uname");
-  record.Add("OSType", KernelText(kernel.sysname));
-  record.Add("KernelRelease", KernelText(kernel.release));
-  record.Add("KernelVersion", KernelText(kernel.version));
-  record.Add("Architecture", KernelText(kernel.machine));
+  record.SetSource(kernel.fSource);
+  record.Add("OSType", kernel.fSystem);
+  record.Add("KernelRelease", kernel.fRelease);
+  record.Add("KernelVersion", kernel.fVersion);
+  record.Add("Architecture", kernel.fArchitecture);
+
+  TRunningClock const clock = RunningClockOf(files);
+  record.SetSource("/proc/stat");
+  record.Add("LastBootUpTime", clock.fBootTime);
+  record.SetSource("/proc/stat, /proc/uptime");
+  record.Add("LocalDateTime", clock.fTime);
+  record.SetSource("/proc");
+  record.Add("NumberOfProcesses", NumberOfProcesses(files));
+  AddMemory(record, memory);
   return record;
 }
 

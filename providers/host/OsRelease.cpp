@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "OsRelease.h"
 
-#include <fstream>
+#include <algorithm>
 
 namespace NQRVZEP20 {
 
@@ -41,14 +41,9 @@ std::map<std::string, std::string> ParseOsRelease(std::string_view text) {
   return values;
 }
 
-TOsRelease TOsRelease::OfThisMachine() {
-  for (char const* name : kFiles) {
-    std::ifstream file(name, std::ios::binary);
-    std::string text;
-    std::getline(file, text, '\0');
-    bool const isComplete = file.is_open() && !file.bad();
-    if (isComplete) return TOsRelease(name, text);
-  }
+TOsRelease TOsRelease::ReadFrom(TMachineFiles const& files) {
+  for (char const* name : kFiles)
+    if (auto const text = files.Content(name)) return TOsRelease(name, *text);
   return TOsRelease("", "");
 }
 

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "providers/reasons/TFinding.h"
+#include "providers/reasons/TMachineFiles.h"
 
 #include <map>
 #include <string>
@@ -16,8 +16,8 @@ std::map<std::string, std::string> ParseOsRelease(std::string_view text);
 // The os-release file of an operating system.
 class TOsRelease {
 public:
-  // Reads the first of the two standard files that can be opened: /etc/os-release, /usr/lib/os-release.
-  static TOsRelease OfThisMachine();
+  // Reads the first of the two standard files that can be read: /etc/os-release, /usr/lib/os-release.
+  static TOsRelease ReadFrom(TMachineFiles const& files);
 
   // `file`: the path of the file; empty when there is none.
   TOsRelease(std::string file, std::string_view text) : fFile(std::move(file)), fValues(ParseOsRelease(text)) {}

@@ -99,9 +99,9 @@ TRecord MakeRecord(TSystemName const& name, TText const& id, TText const& type, 
 
 }  // namespace
 
-std::string ScsiDirectory() {
+std::string ScsiDirectory(TMachineFiles const& files) {
   char const* const named = std::getenv("ZEP_SCSI_DEVICES");
-  return named != nullptr && *named != '\0' ? named : kKernelDirectory;
+  return named != nullptr && *named != '\0' ? named : files.Outside(kKernelDirectory);
 }
 
 std::vector<TRecord> ScsiRecords(std::string const& directory, TSystemName const& name) {

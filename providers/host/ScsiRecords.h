@@ -2,6 +2,7 @@
 #pragma once
 
 #include "TSystemName.h"
+#include "providers/reasons/TMachineFiles.h"
 #include "providers/reasons/TRecord.h"
 
 #include <string>
@@ -12,7 +13,7 @@ namespace NQRVZEP20 {
 // The SCSI devices of this machine, including USB and SATA disks, as the kernel lists them.
 
 // The directory in which the kernel lists them, or for tests the one named by the environment variable ZEP_SCSI_DEVICES.
-std::string ScsiDirectory();
+std::string ScsiDirectory(TMachineFiles const& files);
 
 // One record per device, in the order of their addresses. A device that is removed during the call is omitted.
 std::vector<TRecord> ScsiRecords(std::string const& directory, TSystemName const& name);

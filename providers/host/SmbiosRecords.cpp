@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "SmbiosRecords.h"
 
-#include "Placeholder.h"
+#include "SmbiosFields.h"
 #include "TCIMDateTime.h"
 #include "TCIMSchemaHelper.h"
 #include "TZEPException.h"
@@ -14,29 +14,7 @@ namespace NQRVZEP20 {
 
 namespace {
 
-TMissing Unknown() { return {kMissingNotGiven, "the firmware reports it as unknown"}; }
-
-TFinding<std::string> TextOf(TSmbiosStructure const& structure, std::size_t offset) {
-  return structure.Text(offset).Then(WithoutPlaceholder);
-}
-
-// The number as a T; missing when it is `unknown`, the number that SMBIOS defines for that.
-template <class T, class TNumber>
-TFinding<T> NumberOf(TFinding<TNumber> const& number, TNumber unknown) {
-  return number.Then([unknown](TNumber known) -> TFinding<T> {
-    if (known == unknown) return Unknown();
-    return static_cast<T>(known);
-  });
-}
-
-bool IsNumber(TFinding<std::uint8_t> const& found, std::uint8_t number) { return found && *found == number; }
-bool IsNumber(TFinding<std::uint16_t> const& found, std::uint16_t number) { return found && *found == number; }
-
 // ---- System ----
-
-bool AreAll(std::vector<unsigned char> const& bytes, unsigned char value) {
-  return std::all_of(bytes.begin(), bytes.end(), [value](unsigned char byte) { return byte == value; });
-}
 
 // Bytes in the order in which a UUID is printed.
 TFinding<std::string> UuidFrom(std::vector<unsigned char> const& u) {
@@ -182,71 +160,6 @@ TFinding<std::string> ChassisSkuOf(TSmbiosStructure const& chassis) {
   });
 }
 
-// ---- Processor ----
-
-// The family; the first field may refer to the second family field.
-TFinding<std::uint16_t> FamilyOf(TSmbiosStructure const& processor) {
-  constexpr std::uint8_t unknown = 2, seeFamily2 = 0xfe;
-  auto const family = processor.Byte(0x06);
-  if (IsNumber(family, seeFamily2)) return processor.Word(0x28);
-  return NumberOf<std::uint16_t>(family, unknown);
-}
-
-TFinding<std::string> RoleFrom(std::uint8_t type) {
-  constexpr char const* roles[] = {"Other", "Unknown", "Central Processor", "Math Processor", "DSP Processor", "Video Processor"};
-  if (type == 0 || type > std::size(roles))
-    return TMissing{kMissingUnexpected, "not in the expected form: processor type " + std::to_string(type)};
-  return std::string(roles[type - 1]);
-}
-
-TFinding<std::string> RoleOf(TSmbiosStructure const& processor) {
-  return NumberOf<std::uint8_t>(processor.Byte(0x05), std::uint8_t(2)).Then(RoleFrom);
-}
-
-// CIM numbers sockets as SMBIOS does, up to the last one in its list.
-std::uint16_t UpgradeMethodFrom(std::uint16_t socket) {
-  constexpr std::uint16_t other = 1, last = 56;
-  return socket > last ? other : socket;
-}
-
-TFinding<std::uint16_t> UpgradeMethodOf(TSmbiosStructure const& processor) {
-  return NumberOf<std::uint16_t>(processor.Byte(0x19), std::uint8_t(2)).Then(UpgradeMethodFrom);
-}
-
-TFinding<std::uint16_t> CpuStatusFrom(std::uint8_t field) {
-  std::uint16_t const status = field & 0x07;
-  if (status == 0) return Unknown();
-  return status;
-}
-
-TFinding<std::uint16_t> DataWidthFrom(std::uint16_t characteristics) {
-  constexpr std::uint16_t unknown = 0x02, is64Bit = 0x04;
-  if (characteristics & is64Bit) return std::uint16_t(64);
-  if (characteristics == 0 || characteristics & unknown) return Unknown();
-  return std::uint16_t(32);
-}
-
-// The bytes of the processor's identifier, in their order.
-TFinding<std::string> ProcessorIdFrom(std::vector<unsigned char> const& id) {
-  if (AreAll(id, 0)) return TMissing{kMissingNotGiven, "not set by the firmware (all zeros)"};
-  std::string text;
-  for (unsigned char byte : id) {
-    char digits[3];
-    std::snprintf(digits, sizeof digits, "%02X", byte);
-    text += digits;
-  }
-  return text;
-}
-
-// 255 in the first field refers to the wider second field, if the structure has it.
-TFinding<std::uint16_t> EnabledCoresOf(TSmbiosStructure const& processor) {
-  auto const cores = processor.Byte(0x24);
-  if (IsNumber(cores, 0xff)) {
-    if (auto const wide = processor.Word(0x2c)) return NumberOf<std::uint16_t>(wide, std::uint16_t(0));
-  }
-  return NumberOf<std::uint16_t>(cores, std::uint8_t(0));
-}
-
 // ---- Memory ----
 
 // The CIM number for each SMBIOS number, from 0; -1 for unknown and for numbers without a meaning.
@@ -287,10 +200,20 @@ TFinding<std::uint32_t> SpeedOf(TSmbiosStructure const& memoryDevice, std::size_
   return NumberOf<std::uint32_t>(memoryDevice.DWord(extendedOffset).Then(WithoutReservedBit), std::uint32_t(unknown));
 }
 
+// Either all kinds or all texts.
+TFinding<std::vector<std::string>> PartOf(TIdentifyingTexts const& texts, TSmbiosStructure const& system,
+                                          std::string std::pair<std::string, std::string>::*part) {
+  std::vector<std::string> parts;
+  for (auto const& text : texts.fTexts) parts.push_back(text.*part);
+  if (!parts.empty()) return parts;
+  auto const handle = system.Handle();
+  return handle ? TMissing{kMissingNotGiven, "the SMBIOS tables contain no strings of type 11 or 12"} : handle.Why();
+}
+
 }  // namespace
 
 TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& source, TSystemName const& name,
-                             TFinding<std::optional<TSmbiosVersion>> const& version) {
+                             TFinding<std::optional<TSmbiosVersion>> const& version, TIdentifyingTexts const& texts) {
   TRecord record(TCIMSchemaHelper::kSystemCreationClassName, name.fSource, "CIM_ComputerSystem");
   record.AddKey("CreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
   record.AddKey("Name", name.fName);
@@ -302,6 +225,9 @@ TRecord ComputerSystemRecord(TSmbiosStructure const& system, std::string const& 
   record.Add("UUID", UuidOf(system, version));
   record.Add("SKUNumber", TextOf(system, 0x19));
   record.Add("Family", TextOf(system, 0x1a));
+  record.SetSource(texts.fSource);
+  record.Add("IdentifyingDescriptions", PartOf(texts, system, &std::pair<std::string, std::string>::first));
+  record.Add("OtherIdentifyingInfo", PartOf(texts, system, &std::pair<std::string, std::string>::second));
   return record;
 }
 
@@ -337,27 +263,6 @@ TRecord ChassisRecord(TSmbiosStructure const& chassis, std::string const& source
   return record;
 }
 
-TRecord ProcessorRecord(TSmbiosStructure const& processor, std::string const& source, unsigned number, TSystemName const& name) {
-  TRecord record("CIM_Processor", source);
-  record.AddKey("SystemCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
-  record.AddPropagatedKey("SystemName", name.fName);
-  record.AddKey("CreationClassName", "CIM_Processor");
-  record.AddKey("DeviceID", "Processor " + std::to_string(number));
-  record.Add("Name", TextOf(processor, 0x04));
-  record.Add("ElementName", TextOf(processor, 0x10));
-  record.Add("Role", RoleOf(processor));
-  record.Add("Family", FamilyOf(processor));
-  record.Add("UpgradeMethod", UpgradeMethodOf(processor)).Names(kUpgradeMethodNames);
-  record.Add("MaxClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x14), std::uint16_t(0))).Unit("hertz * 10^6");
-  record.Add("CurrentClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x16), std::uint16_t(0))).Unit("hertz * 10^6");
-  record.Add("ExternalBusClockSpeed", NumberOf<std::uint32_t>(processor.Word(0x12), std::uint16_t(0))).Unit("hertz * 10^6");
-  record.Add("DataWidth", processor.Word(0x26).Then(DataWidthFrom)).Unit("bit");
-  record.Add("UniqueID", processor.Bytes(0x08, 8).Then(ProcessorIdFrom));
-  record.Add("CPUStatus", processor.Byte(0x18).Then(CpuStatusFrom)).Names(kCPUStatusNames);
-  record.Add("NumberOfEnabledCores", EnabledCoresOf(processor));
-  return record;
-}
-
 TRecord MemoryRecord(TSmbiosStructure const& memoryDevice, std::string const& source, unsigned number) {
   TRecord record("CIM_PhysicalMemory", source);
   record.AddKey("Tag", "Memory device " + std::to_string(number));
@@ -380,12 +285,6 @@ TRecord MemoryRecord(TSmbiosStructure const& memoryDevice, std::string const& so
   record.Add("MaxMemorySpeed", speed).Unit("hertz * 10^6");
   record.Add("ConfiguredMemoryClockSpeed", SpeedOf(memoryDevice, 0x20, 0x58)).Unit("hertz * 10^6");
   return record;
-}
-
-bool IsSocketFilled(TSmbiosStructure const& processor) {
-  constexpr std::uint8_t populated = 0x40;
-  auto const status = processor.Byte(0x18);
-  return !status || *status & populated;
 }
 
 bool IsSlotFilled(TSmbiosStructure const& memoryDevice) { return !IsNumber(memoryDevice.Word(0x0c), std::uint16_t(0)); }

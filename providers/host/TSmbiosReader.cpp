@@ -16,7 +16,7 @@ constexpr char const* kKernelTable = "/sys/firmware/dmi/tables/DMI";
 constexpr std::size_t kLargestStructure = 64 * 1024;  // a longer structure is truncated
 constexpr std::size_t kMostStructures = 4096;         // of one type: a library may return structures endlessly
 
-std::string TableFile() {
+std::string NamedFile() {
   char const* file = std::getenv(kTableFileVariable);
   return file != nullptr ? file : "";
 }
@@ -62,12 +62,28 @@ char const* NameOf(int type) {
       return "BIOS Information";
     case kSmbiosSystem:
       return "System Information";
+    case kSmbiosBoard:
+      return "Baseboard";
     case kSmbiosChassis:
       return "Chassis";
     case kSmbiosProcessor:
       return "Processor";
+    case kSmbiosSlot:
+      return "System Slots";
+    case kSmbiosOemStrings:
+      return "OEM Strings";
+    case kSmbiosOptions:
+      return "System Configuration Options";
+    case kSmbiosMemoryArray:
+      return "Physical Memory Array";
     case kSmbiosMemoryDevice:
       return "Memory Device";
+    case kSmbiosBoot:
+      return "System Boot Information";
+    case kSmbiosIpmi:
+      return "IPMI Device Information";
+    case kSmbiosOnboardDevice:
+      return "Onboard Devices Extended Information";
     default:
       return "other";
   }
@@ -75,12 +91,14 @@ char const* NameOf(int type) {
 
 }  // namespace
 
-TSmbiosReader::TSmbiosReader()
-    : fTables(std::make_unique<TSmbiosTables>(TSmbiosTables::kClosedWithTables)), fTableFile(TableFile()) {
+TSmbiosReader::TSmbiosReader(TMachineFiles const& files)
+    : fTables(std::make_unique<TSmbiosTables>(TSmbiosTables::kClosedWithTables)),
+      fNamedFile(NamedFile()),
+      fKernelFile(files.Outside(kKernelTable)) {
   if (!fTables->Library())
     fWhyNot = WhyNotLoaded(fTables->Library());
   else if (!fTables->HasHandle())
-    fWhyNot = WhyTablesFailed(*fTables, fTableFile);
+    fWhyNot = WhyTablesFailed(*fTables, fNamedFile);
   if (!fTables->HasHandle()) fTables.reset();
 }
 
@@ -104,12 +122,12 @@ std::vector<TSmbiosStructure> TSmbiosReader::All(int type) const {
 }
 
 TFinding<std::optional<TSmbiosVersion>> TSmbiosReader::Version() const {
-  return VersionOfTables(fTableFile.empty() ? kKernelTable : fTableFile);
+  return VersionOfTables(IsOfNamedFile() ? fNamedFile : fKernelFile);
 }
 
 std::string TSmbiosReader::SourceOf(int type) const {
   std::string const source = "SMBIOS type " + std::to_string(type);
-  return fTableFile.empty() ? source : source + " (file)";
+  return IsOfNamedFile() ? source + " (file)" : source;
 }
 
 TMissing TSmbiosReader::WhyNone(int type) const {

@@ -3,6 +3,7 @@
 
 #include "SmbiosVersion.h"
 #include "TSmbiosStructure.h"
+#include "providers/reasons/TMachineFiles.h"
 
 #include <memory>
 #include <string>
@@ -13,11 +14,12 @@ namespace NQRVZEP20 {
 class TSmbiosTables;
 
 // The SMBIOS tables as libsmbios.so reads them: this machine's, or those of the file that the environment variable
-// ZEP_SMBIOS_TABLE names. If the library cannot be loaded or the tables cannot be read, every structure is missing, with the
-// reason.
+// ZEP_SMBIOS_TABLE names, or those below the directory that ZEP_ROOT names. If the library cannot be loaded or the tables cannot
+// be read, every structure is missing, with the reason.
 class TSmbiosReader {
 public:
-  TSmbiosReader();
+  // `files`: those of this process (TMachineFiles::OfThisProcess), because libsmbios.so reads the environment variable, too.
+  explicit TSmbiosReader(TMachineFiles const& files = TMachineFiles::OfThisProcess());
   ~TSmbiosReader();
   TSmbiosReader(TSmbiosReader const&) = delete;
   TSmbiosReader& operator=(TSmbiosReader const&) = delete;
@@ -27,6 +29,9 @@ public:
 
   // All structures of that type, in table order; only the first if the library lacks smBiosGetNext.
   std::vector<TSmbiosStructure> All(int type) const;
+
+  // Whether the tables are those of a file that ZEP_SMBIOS_TABLE names, which may be from another machine.
+  bool IsOfNamedFile() const { return !fNamedFile.empty(); }
 
   // The version of the SMBIOS standard that the tables conform to, as returned by VersionOfTables.
   TFinding<std::optional<TSmbiosVersion>> Version() const;
@@ -40,7 +45,8 @@ public:
 private:
   std::unique_ptr<TSmbiosTables> fTables;  // null: the tables cannot be read, for the reason in fWhyNot
   TMissing fWhyNot;
-  std::string fTableFile;  // empty: this machine's own tables
+  std::string fNamedFile;  // by ZEP_SMBIOS_TABLE; empty: the tables that the kernel exports
+  std::string fKernelFile;
 };
 
 }  // namespace NQRVZEP20

@@ -39,6 +39,8 @@ TFinding<std::uint32_t> TSmbiosStructure::DWord(std::size_t offset) const {
   return Bytes(offset, 4).Then(LittleEndian).Then(As<std::uint32_t>);
 }
 
+TFinding<std::uint64_t> TSmbiosStructure::QWord(std::size_t offset) const { return Bytes(offset, 8).Then(LittleEndian); }
+
 TFinding<std::vector<unsigned char>> TSmbiosStructure::Bytes(std::size_t offset, std::size_t count) const {
   if (!fWhyAbsent.fCode.empty()) return fWhyAbsent;
   if (offset + count > FormattedSize()) return TMissing{kMissingNotGiven, "the firmware's structure ends before this field"};
@@ -52,15 +54,22 @@ TFinding<std::string> TSmbiosStructure::Text(std::size_t offset) const {
 TFinding<std::string> TSmbiosStructure::StringAt(std::uint8_t number) const {
   if (number == 0) return TMissing{kMissingNotGiven, "not given by the firmware"};
 
-  auto text = fBytes.begin() + FormattedSize();
-  for (int at = 1; text != fBytes.end() && *text != 0; ++at) {
-    auto const end = std::find(text, fBytes.end(), 0);
-    if (end == fBytes.end()) break;
-    if (at == number) return std::string(text, end);
-    text = end + 1;
-  }
+  auto const texts = Texts();
+  if (number <= texts.size()) return texts[number - 1];
   return TMissing{kMissingUnexpected,
                   "the firmware refers to string " + std::to_string(number) + ", which the structure does not contain"};
+}
+
+std::vector<std::string> TSmbiosStructure::Texts() const {
+  std::vector<std::string> texts;
+  auto text = fBytes.begin() + FormattedSize();
+  while (text != fBytes.end() && *text != 0) {
+    auto const end = std::find(text, fBytes.end(), 0);
+    if (end == fBytes.end()) break;
+    texts.emplace_back(text, end);
+    text = end + 1;
+  }
+  return texts;
 }
 
 std::size_t TSmbiosStructure::FormattedSize() const {

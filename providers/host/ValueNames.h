@@ -147,4 +147,75 @@ constexpr TValueName kFormFactorNames[] = {
     {"18", "SOIC"},       {"19", "LCC"},   {"20", "PLCC"}, {"21", "BGA"},  {"22", "FPBGA"}, {"23", "LGA"}};
 constexpr TValueName kTargetOperatingSystemNames[] = {{"0", "Unknown"}};
 
+constexpr TValueName kProcessorCharacteristicNames[] = {{"0", "Unknown"},
+                                                        {"1", "DMTF Reserved"},
+                                                        {"2", "64-bit Capable"},
+                                                        {"3", "32-bit Capable"},
+                                                        {"4", "Enhanced Virtualization"},
+                                                        {"5", "Hardware Thread"},
+                                                        {"6", "NX-bit"},
+                                                        {"7", "Power/Performance Control"},
+                                                        {"8", "Core Frequency Boosting"},
+                                                        {"9..32567", "DMTF Reserved"},
+                                                        {"32568..65535", "Vendor Reserved"}};
+constexpr TValueName kCoreEnabledStateNames[] = {
+    {"0", "Unknown"},       {"1", "DMTF Reserved"},         {"2", "Core Enabled"},
+    {"3", "Core Disabled"}, {"4", "Core Disabled by User"}, {"5", "Core Disabled By POST Error)"}};
+constexpr TValueName kCacheLevelNames[] = {{"0", "Unknown"}, {"1", "Other"},     {"2", "Not Applicable"},
+                                           {"3", "Primary"}, {"4", "Secondary"}, {"5", "Tertiary"}};
+constexpr TValueName kCacheTypeNames[] = {
+    {"0", "Unknown"}, {"1", "Other"}, {"2", "Instruction"}, {"3", "Data"}, {"4", "Unified"}};
+constexpr TValueName kAssociativityNames[] = {{"0", "Unknown"},
+                                              {"1", "Other"},
+                                              {"2", "Direct Mapped"},
+                                              {"3", "2-way Set-Associative"},
+                                              {"4", "4-way Set-Associative"},
+                                              {"5", "Fully Associative"},
+                                              {"6", "8-way Set-Associative"},
+                                              {"7", "16-way Set-Associative"},
+                                              {"8", "12-way Set Associative"},
+                                              {"9", "24-way Set Associative"},
+                                              {"10", "32-way Set Associative"},
+                                              {"11", "48-way Set Associative"},
+                                              {"12", "64-way Set Associative"},
+                                              {"13", "20-way Set Associative"}};
+constexpr TValueName kArrayMemoryTypeNames[] = {{"0", "Unknown"},
+                                                {"1", "Other"},
+                                                {"2", "DRAM"},
+                                                {"3", "Synchronous DRAM"},
+                                                {"4", "Cache DRAM"},
+                                                {"5", "EDO"},
+                                                {"6", "EDRAM"},
+                                                {"7", "VRAM"},
+                                                {"8", "SRAM"},
+                                                {"9", "RAM"},
+                                                {"10", "ROM"},
+                                                {"11", "Flash"},
+                                                {"12", "EEPROM"},
+                                                {"13", "FEPROM"},
+                                                {"14", "EPROM"},
+                                                {"15", "CDRAM"},
+                                                {"16", "3DRAM"},
+                                                {"17", "SDRAM"},
+                                                {"18", "SGRAM"},
+                                                {"19", "RDRAM"},
+                                                {"20", "DDR"},
+                                                {"21", "DDR2"},
+                                                {"22", "BRAM"},
+                                                {"23", "FB-DIMM"},
+                                                {"24", "DDR3"},
+                                                {"25", "FBD2"},
+                                                {"26", "DDR4"},
+                                                {"27", "LPDDR"},
+                                                {"28", "LPDDR2"},
+                                                {"29", "LPDDR3"},
+                                                {"30", "LPDDR4"},
+                                                {"31..32567", "DMTF Reserved"},
+                                                {"32568..65535", "Vendor Reserved"}};
+constexpr TValueName kRemovalConditionsNames[] = {
+    {"0", "Unknown"}, {"2", "Not Applicable"}, {"3", "Removable when off"}, {"4", "Removable when on or off"}};
+constexpr TValueName kMaxLinkWidthNames[] = {{"0", "Unknown"}, {"2", "x1"},  {"3", "x2"},
+                                             {"4", "x4"},      {"5", "x8"},  {"6", "x12"},
+                                             {"7", "x16"},     {"8", "x32"}, {"9..", "DMTF Reserved"}};
+
 }  // namespace NQRVZEP20

@@ -2,13 +2,11 @@
 #include "providers/host/HostRecords.h"
 #include "providers/host/OsRelease.h"
 #include "tests/Support.h"
+#include "tests/providers/host/KernelTree.h"
 #include "tests/providers/host/Structures.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-#include <sys/utsname.h>
-
-#include <cstring>
 
 namespace NQRVZEP20 {
 namespace {
@@ -69,26 +67,32 @@ TEST(OsReleaseTest, WithoutAFileEveryValueIsUnreadable) {
 }
 
 TEST(OsReleaseTest, ThisMachineHasAFileWithAName) {
-  TOsRelease const release = TOsRelease::OfThisMachine();
+  TOsRelease const release = TOsRelease::ReadFrom(TMachineFiles("/"));
   if (release.GetFile().empty()) GTEST_SKIP() << "this machine has no os-release file";
   auto const name = release.Value({"NAME"});
   ASSERT_TRUE(name);
   EXPECT_NE(ReadFile(release.GetFile()).find(*name), std::string::npos);
 }
 
-utsname KernelOf(char const* node) {
-  utsname kernel = {};
-  std::strcpy(kernel.sysname, "Linux");
-  std::strcpy(kernel.nodename, node);
-  std::strcpy(kernel.release, "6.1.0-56-amd64");
-  std::strcpy(kernel.version, "#1 SMP");
-  std::strcpy(kernel.machine, "x86_64");
-  return kernel;
+TKernelNames KernelOf(std::string const& node) {
+  return {"uname", std::string("Linux"), node, std::string("6.1.0-56-amd64"), std::string("#1 SMP"), std::string("x86_64")};
+}
+
+// The record of a system with this os-release text, whose other files are below `root`.
+TRecord RecordOf(TOsRelease const& release, TTempDir const& root) {
+  TMachineFiles const files(root.Path());
+  return OperatingSystemRecord(release, KernelOf("db1"), TMemInfo::ReadFrom(files, "/proc/meminfo"), files,
+                               TSystemName{"db1", "uname"});
 }
 
 TEST(OsReleaseTest, TheOperatingSystemIsDescribedByItsFileAndItsKernel) {
-  TRecord const record =
-      OperatingSystemRecord(TOsRelease("/usr/lib/os-release", kDebian), KernelOf("db1"), TSystemName{"db1", "uname"});
+  TTempDir const root;
+  TKernelTree const tree(root.Path());
+  tree.Write("/proc/stat", "cpu 1 2\nbtime 1700000000");
+  tree.Write("/proc/uptime", "3600.71 7000.00");
+  tree.Write("/proc/17/stat", "");
+  tree.Write("/proc/meminfo", "MemTotal: 100 kB\nMemFree: 40 kB\nSwapTotal: 20 kB\nSwapFree: 10 kB");
+  TRecord const record = RecordOf(TOsRelease("/usr/lib/os-release", kDebian), root);
   EXPECT_EQ(record.GetClassName(), "QRVSG_OperatingSystem");
 
   struct TRow {
@@ -105,6 +109,15 @@ TEST(OsReleaseTest, TheOperatingSystemIsDescribedByItsFileAndItsKernel) {
       {"KernelRelease", "string 6.1.0-56-amd64", "uname", false},
       {"KernelVersion", "string #1 SMP", "uname", false},
       {"Architecture", "string x86_64", "uname", false},
+      {"LastBootUpTime", "datetime 20231114221320.000000+000", "/proc/stat", false},
+      {"LocalDateTime", "datetime 20231114231320.000000+000", "/proc/stat, /proc/uptime", false},
+      {"NumberOfProcesses", "uint32 1", "/proc", false},
+      {"TotalVisibleMemorySize", "uint64 100", "/proc/meminfo", false},
+      {"FreePhysicalMemory", "uint64 40", "/proc/meminfo", false},
+      {"TotalSwapSpaceSize", "uint64 20", "/proc/meminfo", false},
+      {"FreeSpaceInPagingFiles", "uint64 10", "/proc/meminfo", false},
+      {"TotalVirtualMemorySize", "uint64 120", "/proc/meminfo", false},
+      {"FreeVirtualMemory", "uint64 50", "/proc/meminfo", false},
   };
   ASSERT_EQ(record.GetProperties().size(), std::size(rows));
   for (std::size_t at = 0; at < std::size(rows); ++at) {
@@ -118,8 +131,9 @@ TEST(OsReleaseTest, TheOperatingSystemIsDescribedByItsFileAndItsKernel) {
 }
 
 TEST(OsReleaseTest, ASystemWithoutVersionHasItsBuildInstead) {
-  auto const version = [](std::string const& text) {
-    return PropertyOf(OperatingSystemRecord(TOsRelease("/etc/os-release", text), KernelOf("a"), {"a", "uname"}), "Version");
+  TTempDir const root;
+  auto const version = [&](std::string const& text) {
+    return PropertyOf(RecordOf(TOsRelease("/etc/os-release", text), root), "Version");
   };
   EXPECT_EQ(version("NAME=R\nBUILD_ID=rolling\n"), "string rolling");
   EXPECT_EQ(version("NAME=R\nVERSION_ID=39\nBUILD_ID=x\n"), "string 39");

@@ -105,11 +105,11 @@ TEST_F(ScsiRecordsTest, WithoutTheDirectoryThereAreNoDevices) {
 
 TEST_F(ScsiRecordsTest, TheEnvironmentMayNameAnotherDirectory) {
   TEnvironmentGuard const named("ZEP_SCSI_DEVICES", fPath.c_str());
-  EXPECT_EQ(ScsiDirectory(), fPath);
+  EXPECT_EQ(ScsiDirectory(TMachineFiles("/")), fPath);
   TEnvironmentGuard const empty("ZEP_SCSI_DEVICES", "");
-  EXPECT_EQ(ScsiDirectory(), "/sys/bus/scsi/devices");
+  EXPECT_EQ(ScsiDirectory(TMachineFiles("/")), "/sys/bus/scsi/devices");
   TEnvironmentGuard const unset("ZEP_SCSI_DEVICES", nullptr);
-  EXPECT_EQ(ScsiDirectory(), "/sys/bus/scsi/devices");
+  EXPECT_EQ(ScsiDirectory(TMachineFiles("/")), "/sys/bus/scsi/devices");
 }
 
 }  // namespace

@@ -55,15 +55,18 @@ TEST(SystemRecordTest, EveryFieldIsReadAtItsOffset) {
                                             .Text(0x1a, "Server Q"));
   EXPECT_EQ(record.GetClassName(), "QRVSG_ComputerSystem");
   EXPECT_THAT(KeysOf(record), ElementsAre("CreationClassName", "Name"));
-  ExpectProperties(record, {{"CreationClassName", "string QRVSG_ComputerSystem"},
-                            {"Name", "string db1"},
-                            {"Manufacturer", "string Example Works"},
-                            {"ProductName", "string Server Q100 -[1234AB7]-"},
-                            {"Version", "string 06"},
-                            {"SerialNumber", "string KQ12345"},
-                            {"UUID", "string 00112233-4455-6677-8899-AABBCCDDEEFF"},
-                            {"SKUNumber", "string 1234AB7"},
-                            {"Family", "string Server Q"}});
+  ExpectProperties(record,
+                   {{"CreationClassName", "string QRVSG_ComputerSystem"},
+                    {"Name", "string db1"},
+                    {"Manufacturer", "string Example Works"},
+                    {"ProductName", "string Server Q100 -[1234AB7]-"},
+                    {"Version", "string 06"},
+                    {"SerialNumber", "string KQ12345"},
+                    {"UUID", "string 00112233-4455-6677-8899-AABBCCDDEEFF"},
+                    {"SKUNumber", "string 1234AB7"},
+                    {"Family", "string Server Q"},
+                    {"IdentifyingDescriptions", "string NULL not-given: the SMBIOS tables contain no strings of type 11 or 12"},
+                    {"OtherIdentifyingInfo", "string NULL not-given: the SMBIOS tables contain no strings of type 11 or 12"}});
 }
 
 TEST(SystemRecordTest, TheNameAndTheTableHaveDifferentSources) {
@@ -71,6 +74,14 @@ TEST(SystemRecordTest, TheNameAndTheTableHaveDifferentSources) {
   EXPECT_EQ(record.GetProperties()[0].fSource, "");
   EXPECT_EQ(record.GetProperties()[1].fSource, "uname");
   EXPECT_EQ(record.GetProperties()[2].fSource, "SMBIOS type 1");
+}
+
+TEST(SystemRecordTest, FurtherTextsAreBesideTheirKinds) {
+  TIdentifyingTexts const texts{"SMBIOS type 11", {{"OEM string", "a"}, {"Configuration option", "b"}}};
+  TRecord const record =
+      ComputerSystemRecord(System().Make(), "SMBIOS type 1", TSystemName{"db1", "uname"}, std::optional<TSmbiosVersion>(), texts);
+  EXPECT_EQ(PropertyOf(record, "IdentifyingDescriptions"), "string { OEM string, Configuration option }");
+  EXPECT_EQ(PropertyOf(record, "OtherIdentifyingInfo"), "string { a, b }");
 }
 
 TEST(SystemRecordTest, PlaceholdersAndMissingFieldsAreNullWithAReason) {
@@ -85,7 +96,9 @@ TEST(SystemRecordTest, PlaceholdersAndMissingFieldsAreNullWithAReason) {
        {"SerialNumber", "string NULL unexpected-form: the firmware refers to string 9, which the structure does not contain"},
        {"UUID", "string NULL not-given: not set by the firmware (all zeros)"},
        {"SKUNumber", std::string("string ") + kNoText},
-       {"Family", std::string("string ") + kNoText}});
+       {"Family", std::string("string ") + kNoText},
+       {"IdentifyingDescriptions", "string NULL not-given: the SMBIOS tables contain no strings of type 11 or 12"},
+       {"OtherIdentifyingInfo", "string NULL not-given: the SMBIOS tables contain no strings of type 11 or 12"}});
 }
 
 TEST(SystemRecordTest, TheVersionDecidesTheByteOrderOfTheUuid) {
@@ -250,98 +263,6 @@ TEST(ChassisRecordTest, TheSkuFollowsTheContainedElements) {
   EXPECT_EQ(PropertyOf(ChassisRecord(TStructureMaker(3, 0x0d).Make(), "", 0), "SKU"), std::string("string ") + kTooShort);
 }
 
-// ---- Processor ----
-
-TStructureMaker Processor() { return TStructureMaker(4, 0x30); }
-
-TRecord ProcessorRecordOf(TStructureMaker const& maker) {
-  return ProcessorRecord(maker.Make(), "SMBIOS type 4", 1, TSystemName{"db1", "uname"});
-}
-
-TEST(ProcessorRecordTest, EveryFieldIsReadAtItsOffset) {
-  TRecord const record = ProcessorRecordOf(Processor()
-                                               .Text(0x04, "CPU 1")
-                                               .Byte(0x05, 3)
-                                               .Byte(0x06, 0xb3)
-                                               .Bytes(0x08, "\x54\x06\x05\x00\xff\xfb\xeb\xbf"s)
-                                               .Text(0x10, "Example Processor P2400")
-                                               .Word(0x12, 100)
-                                               .Word(0x14, 3600)
-                                               .Word(0x16, 2400)
-                                               .Byte(0x18, 0x41)
-                                               .Byte(0x19, 0x2b)
-                                               .Byte(0x24, 12)
-                                               .Word(0x26, 0x00fc));
-  EXPECT_EQ(record.GetClassName(), "CIM_Processor");
-  EXPECT_THAT(KeysOf(record), ElementsAre("SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID"));
-  ExpectProperties(record, {{"SystemCreationClassName", "string QRVSG_ComputerSystem"},
-                            {"SystemName", "string db1"},
-                            {"CreationClassName", "string CIM_Processor"},
-                            {"DeviceID", "string Processor 1"},
-                            {"Name", "string CPU 1"},
-                            {"ElementName", "string Example Processor P2400"},
-                            {"Role", "string Central Processor"},
-                            {"Family", "uint16 179"},
-                            {"UpgradeMethod", "uint16 43"},
-                            {"MaxClockSpeed", "uint32 3600"},
-                            {"CurrentClockSpeed", "uint32 2400"},
-                            {"ExternalBusClockSpeed", "uint32 100"},
-                            {"DataWidth", "uint16 64"},
-                            {"UniqueID", "string 54060500FFFBEBBF"},
-                            {"CPUStatus", "uint16 1"},
-                            {"NumberOfEnabledCores", "uint16 12"}});
-}
-
-TEST(ProcessorRecordTest, FieldsThatAreUnknownToTheFirmwareAreNull) {
-  TRecord const record = ProcessorRecordOf(Processor().Byte(0x05, 2).Byte(0x06, 2).Byte(0x19, 2).Word(0x26, 0x0002));
-  for (char const* property : {"Family", "UpgradeMethod", "CPUStatus", "DataWidth", "NumberOfEnabledCores"})
-    EXPECT_EQ(PropertyOf(record, property), std::string("uint16 ") + kUnknown) << property;
-  for (char const* property : {"MaxClockSpeed", "CurrentClockSpeed", "ExternalBusClockSpeed"})
-    EXPECT_EQ(PropertyOf(record, property), std::string("uint32 ") + kUnknown) << property;
-  EXPECT_EQ(PropertyOf(record, "Role"), std::string("string ") + kUnknown);
-  EXPECT_EQ(PropertyOf(record, "UniqueID"), "string NULL not-given: not set by the firmware (all zeros)");
-}
-
-TEST(ProcessorRecordTest, NarrowFieldsMayReferToWideFields) {
-  struct TRow {
-    char const* fDescription;
-    TStructureMaker fMaker;
-    char const *fProperty, *fValue;
-  } const rows[] = {
-      {"family 254 names the second field", Processor().Byte(0x06, 0xfe).Word(0x28, 0x0101), "Family", "uint16 257"},
-      {"family below 254 is itself", Processor().Byte(0x06, 0xfd).Word(0x28, 0x0101), "Family", "uint16 253"},
-      {"255 cores name the second field", Processor().Byte(0x24, 0xff).Word(0x2c, 384), "NumberOfEnabledCores", "uint16 384"},
-      {"254 cores are themselves", Processor().Byte(0x24, 0xfe).Word(0x2c, 384), "NumberOfEnabledCores", "uint16 254"},
-      {"255 cores in a structure without it", TStructureMaker(4, 0x28).Byte(0x24, 0xff), "NumberOfEnabledCores", "uint16 255"},
-      {"a socket newer than CIM", Processor().Byte(0x19, 57), "UpgradeMethod", "uint16 1"},
-      {"the last socket of CIM", Processor().Byte(0x19, 56), "UpgradeMethod", "uint16 56"},
-      {"a 32-bit processor", Processor().Word(0x26, 0x0008), "DataWidth", "uint16 32"},
-  };
-  for (TRow const& row : rows)
-    EXPECT_EQ(PropertyOf(ProcessorRecordOf(row.fMaker), row.fProperty), row.fValue) << row.fDescription;
-}
-
-TEST(ProcessorRecordTest, FieldsOfNewerVersionsAreMissingInOldStructures) {
-  TRecord const record = ProcessorRecordOf(TStructureMaker(4, 0x1a).Byte(0x06, 0xfe));
-  EXPECT_EQ(PropertyOf(record, "Family"), std::string("uint16 ") + kTooShort);
-  EXPECT_EQ(PropertyOf(record, "DataWidth"), std::string("uint16 ") + kTooShort);
-  EXPECT_EQ(PropertyOf(record, "NumberOfEnabledCores"), std::string("uint16 ") + kTooShort);
-}
-
-TEST(ProcessorRecordTest, ARoleOutOfRangeIsUnexpected) {
-  EXPECT_EQ(PropertyOf(ProcessorRecordOf(Processor().Byte(0x05, 6)), "Role"), "string Video Processor");
-  EXPECT_EQ(PropertyOf(ProcessorRecordOf(Processor().Byte(0x05, 7)), "Role"),
-            "string NULL unexpected-form: not in the expected form: processor type 7");
-  EXPECT_EQ(PropertyOf(ProcessorRecordOf(Processor()), "Role"),
-            "string NULL unexpected-form: not in the expected form: processor type 0");
-}
-
-TEST(ProcessorRecordTest, EmptySocketsAreRecognised) {
-  EXPECT_TRUE(IsSocketFilled(Processor().Byte(0x18, 0x41).Make()));
-  EXPECT_FALSE(IsSocketFilled(Processor().Byte(0x18, 0x00).Make()));
-  EXPECT_TRUE(IsSocketFilled(TStructureMaker(4, 0x10).Make())) << "without that field";
-}
-
 // ---- Memory ----
 
 TStructureMaker Module() { return TStructureMaker(17, 0x5c); }
@@ -464,7 +385,6 @@ TEST(SmbiosRecordsTest, EveryRecordOfAClassHasTheSameShape) {
       {SystemRecordOf(System().Text(0x05, "Server")), ComputerSystemRecord(absent, "x", name)},
       {BiosRecord(Bios().Text(0x08, "01/02/2003").Make(), "x", 0), BiosRecord(absent, "x", 1)},
       {ChassisRecord(Chassis().Byte(0x05, 23).Make(), "x", 0), ChassisRecord(absent, "x", 1)},
-      {ProcessorRecordOf(Processor().Byte(0x24, 4)), ProcessorRecord(absent, "x", 0, name)},
       {MemoryRecord(Module().Word(0x0c, 1).Make(), "x", 0), MemoryRecord(absent, "x", 1)},
   };
   for (auto const& [full, empty] : pairs) {
@@ -487,20 +407,19 @@ TEST(SmbiosRecordsTest, NothingIsReadOutsideAStructure) {
     TSmbiosStructure const structure(std::vector<unsigned char>(bytes.begin(), bytes.end()));
     std::size_t count = ComputerSystemRecord(structure, "", name).GetProperties().size();
     count += BiosRecord(structure, "", 0).GetProperties().size() + ChassisRecord(structure, "", 0).GetProperties().size();
-    count +=
-        ProcessorRecord(structure, "", 0, name).GetProperties().size() + MemoryRecord(structure, "", 0).GetProperties().size();
-    static_cast<void>(IsSocketFilled(structure) && IsSlotFilled(structure));
+    count += MemoryRecord(structure, "", 0).GetProperties().size();
+    static_cast<void>(IsSlotFilled(structure));
     return count;
   };
   std::string const seeds[] = {System().Text(0x05, "Server").Table(), Chassis().Byte(0x13, 1).Table(),
-                               Processor().Byte(0x06, 0xfe).Table(), Module().Word(0x0c, 0x7fff).Table()};
+                               Module().Word(0x0c, 0x7fff).Table()};
   for (std::string const& seed : seeds) {
-    for (std::size_t length = 0; length <= seed.size(); ++length) EXPECT_EQ(readAll(seed.substr(0, length)), 62u) << length;
+    for (std::size_t length = 0; length <= seed.size(); ++length) EXPECT_EQ(readAll(seed.substr(0, length)), 48u) << length;
     for (std::size_t at = 0; at < seed.size(); ++at)
       for (int byte : {0x00, 0x01, 0x7f, 0x80, 0xff}) {
         std::string changed = seed;
         changed[at] = static_cast<char>(byte);
-        EXPECT_EQ(readAll(changed), 62u) << at;
+        EXPECT_EQ(readAll(changed), 48u) << at;
       }
   }
 }

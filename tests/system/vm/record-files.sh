@@ -30,7 +30,7 @@ done
 )
 for file in cpuinfo meminfo swaps mdstat uptime loadavg cmdline version stat partitions diskstats modules mounts \
   self/mountinfo net/dev net/route net/ipv6_route net/if_inet6 net/fib_trie \
-  sys/kernel/hostname sys/kernel/osrelease sys/kernel/ostype sys/kernel/version sys/kernel/tainted; do
+  sys/kernel/arch sys/kernel/hostname sys/kernel/osrelease sys/kernel/ostype sys/kernel/version sys/kernel/tainted; do
   cat /proc/$file > $tree/proc/$file 2>/dev/null || rm -f $tree/proc/$file
 done
 for directory in net/bonding net/vlan; do

@@ -1,0 +1,76 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "providers/host/BootRecords.h"
+
+#include "tests/Support.h"
+#include "tests/providers/host/KernelTree.h"
+#include "tests/providers/host/Structures.h"
+
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20 {
+namespace {
+
+class BootRecordsTest : public testing::Test {
+protected:
+  std::string Boot(char const* property) {
+    return PropertyOf(BootRecord(TMachineFiles(fRoot.Path()), fStatus, "SMBIOS type 32"), property);
+  }
+  void Variable(std::string const& name, std::string const& bytes) {
+    std::string const directory = fRoot.Path() + "/sys/firmware/efi/efivars/";
+    std::filesystem::create_directories(directory);
+    WriteFile(directory + name + "-8be4df61-93ca-11d2-aa0d-00e098032b8c", bytes);
+  }
+
+  TTempDir fRoot;
+  TKernelTree fTree{fRoot.Path()};
+  TSmbiosStructure fStatus = TStructureMaker(32, 0x0b).Byte(0x0a, 8).Make();
+};
+
+TEST_F(BootRecordsTest, SecureBootIsAVariableOfTheFirmware) {
+  Variable("SecureBoot", std::string("\x06\0\0\0\x01", 5));
+  Variable("SetupMode", std::string("\x06\0\0\0\0", 5));
+  EXPECT_EQ(Boot("IsUEFI"), "boolean true");
+  EXPECT_EQ(Boot("SecureBoot"), "boolean true");
+  EXPECT_EQ(Boot("SecureBootSetupMode"), "boolean false");
+  Variable("SecureBoot", "\x06");
+  EXPECT_EQ(Boot("SecureBoot"),
+            "boolean NULL unexpected-form: /sys/firmware/efi/efivars/SecureBoot-8be4df61-93ca-11d2-aa0d-00e098032b8c does not "
+            "contain one byte");
+}
+
+TEST_F(BootRecordsTest, WithoutUefiThereIsNoSecureBoot) {
+  EXPECT_EQ(Boot("IsUEFI"), "boolean NULL not-given: /sys/firmware does not exist");
+  EXPECT_EQ(Boot("SecureBoot"), "boolean NULL not-given: /sys/firmware does not exist");
+  fTree.Write("/sys/firmware/dmi/tables/DMI", "");
+  EXPECT_EQ(Boot("IsUEFI"), "boolean false");
+  EXPECT_EQ(Boot("SecureBoot"), "boolean NULL not-applicable: the machine was not started by UEFI firmware");
+}
+
+TEST_F(BootRecordsTest, TheCommandLineAndTheStatusAreThoseOfTheStart) {
+  fTree.Write("/proc/cmdline", "BOOT_IMAGE=/vmlinuz root=/dev/sda1 quiet");
+  EXPECT_EQ(Boot("KernelCommandLine"), "string BOOT_IMAGE=/vmlinuz root=/dev/sda1 quiet");
+  EXPECT_EQ(Boot("FirmwareBootStatus"), "string System watchdog timer expired");
+  fStatus = TStructureMaker(32, 0x0b).Byte(0x0a, 200).Make();
+  EXPECT_EQ(Boot("FirmwareBootStatus"), "string Product-specific status 200");
+  fStatus = TStructureMaker(32, 0x0b).Byte(0x0a, 9).Make();
+  EXPECT_EQ(Boot("FirmwareBootStatus"), "string NULL unexpected-form: not in the expected form: boot status 9");
+}
+
+TEST_F(BootRecordsTest, ATpmHasItsVersionAndItsBanks) {
+  fTree.Write("/sys/class/tpm/tpm0/tpm_version_major", "2");
+  fTree.Write("/sys/class/tpm/tpm0/pcr-sha1/0", "");
+  fTree.Write("/sys/class/tpm/tpm0/pcr-sha256/0", "");
+  fTree.Write("/sys/class/tpm/tpm1/caps", "Manufacturer: 0x49465800\nTCG version: 1.2\nFirmware version: 3.17");
+  fTree.Write("/sys/class/tpm/tpm2/caps", "none");
+  auto const records = TpmRecords(TMachineFiles(fRoot.Path()), TSystemName{"db1", "uname"});
+  ASSERT_EQ(records.size(), 3u);
+  EXPECT_EQ(PropertyOf(records[0], "DeviceID"), "string tpm0");
+  EXPECT_EQ(PropertyOf(records[0], "SpecificationVersion"), "string 2.0");
+  EXPECT_EQ(PropertyOf(records[0], "RegisterBanks"), "string { sha1, sha256 }");
+  EXPECT_EQ(PropertyOf(records[1], "SpecificationVersion"), "string 1.2");
+  EXPECT_EQ(PropertyOf(records[2], "SpecificationVersion"),
+            "string NULL not-given: /sys/class/tpm/tpm2/caps contains no version");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20
