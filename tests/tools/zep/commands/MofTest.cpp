@@ -156,7 +156,7 @@ TEST_F(MofTest, ClassesOfProvidersAreListed) {
   TRun const run = Run({"classes"});
   EXPECT_EQ(run.fStatus, 0);
   EXPECT_THAT(run.fOutput, testing::StartsWith("root/zep/host (Host): "));
-  EXPECT_THAT(run.fOutput, HasSubstr("\nCIM_Chassis                           CIM_PhysicalFrame\n"));
+  EXPECT_THAT(run.fOutput, HasSubstr("\nCIM_Chassis                            CIM_PhysicalFrame\n"));
   EXPECT_THAT(Run({"classes", "--sample"}).fOutput, testing::StartsWith("SAMPLE root/zep/host (Host): "));
 }
 
@@ -165,7 +165,7 @@ TEST_F(MofTest, WithAFailedPlugInTheListIsPartial) {
   TRun const run = Run({"classes"});
   EXPECT_EQ(run.fStatus, 2);
   EXPECT_THAT(run.fErrors, HasSubstr("zep: Broken: "));
-  EXPECT_THAT(run.fOutput, HasSubstr("\nCIM_Chassis                           CIM_PhysicalFrame\n"));
+  EXPECT_THAT(run.fOutput, HasSubstr("\nCIM_Chassis                            CIM_PhysicalFrame\n"));
   fZep.Remove("libHost.nsp.so");
   EXPECT_EQ(Run({"classes"}).fStatus, 1);
 }

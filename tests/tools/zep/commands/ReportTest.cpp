@@ -392,6 +392,8 @@ TEST_F(ReportTest, JsonListsEveryInstanceWithItsPath) {
     paths.push_back(instance["path"]);
     EXPECT_EQ(instance["path"].get<std::string>().find("root/zep/host:" + instance["class"].get<std::string>() + "."), 0u);
   }
+  EXPECT_GT(counts["ZEP_MissingValue"], 3);  // some values are those of this machine
+  counts.erase("ZEP_MissingValue");
   EXPECT_EQ(counts, (std::map<std::string, int>{{"QRVSG_ComputerSystem", 1},
                                                 {"QRVSG_OperatingSystem", 1},
                                                 {"QRVSG_ZEPProduct", 1},
@@ -399,7 +401,17 @@ TEST_F(ReportTest, JsonListsEveryInstanceWithItsPath) {
                                                 {"CIM_Chassis", 1},
                                                 {"CIM_Processor", 2},
                                                 {"CIM_PhysicalMemory", 8},
-                                                {"ZEP_MissingValue", 3}}));
+                                                {"CIM_MemoryCapacity", 1},
+                                                {"CIM_Card", 1},
+                                                {"CIM_Slot", 6},
+                                                {"ZEP_OnboardDevice", 4},
+                                                {"ZEP_IPMIInterface", 1},
+                                                {"ZEP_RunningState", 1},
+                                                {"CIM_SystemDevice", 3},
+                                                {"CIM_SystemBIOS", 1},
+                                                {"CIM_ComputerSystemPackage", 2},
+                                                {"CIM_RunningOS", 1},
+                                                {"CIM_ElementStatisticalData", 1}}));
   std::sort(paths.begin(), paths.end());
   EXPECT_EQ(std::unique(paths.begin(), paths.end()), paths.end());
 }

@@ -31,8 +31,10 @@ protected:
 };
 
 TEST_F(ShowTest, EveryPathInAReportIsShown) {
+  TTempDir const nothing;  // instead of this machine, whose load changes
+  TEnvironmentGuard const root("ZEP_ROOT", nothing.Path().c_str());
   auto const instances = JsonOf(Run({"report", "--json"}))["instances"];
-  EXPECT_EQ(instances.size(), 20u);
+  EXPECT_GT(instances.size(), 100u);
   for (auto const& instance : instances) {
     TRun const run = Run({"show", instance["path"], "--json"});
     EXPECT_EQ(run.fStatus, 0) << instance["path"] << run.fErrors;
@@ -42,6 +44,8 @@ TEST_F(ShowTest, EveryPathInAReportIsShown) {
 }
 
 TEST_F(ShowTest, EveryPathNamesOneObject) {
+  TTempDir const nothing;
+  TEnvironmentGuard const root("ZEP_ROOT", nothing.Path().c_str());
   auto const instances = JsonOf(Run({"report", "--json"}, "hard-to-name"))["instances"];
   std::set<std::string> paths;
   for (auto const& instance : instances) {
