@@ -47,7 +47,7 @@ std::vector<TSubject> const& Subjects() {
        "Processors",
        "CIM_Processor",
        {{"Processor", "DeviceID"},
-        {"Name", "Name"},
+        {"Name", "ElementName"},
         {"Cores", "NumberOfEnabledCores"},
         {"Speed", "MaxClockSpeed"},
         {"Status", "CPUStatus"}}},
