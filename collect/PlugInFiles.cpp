@@ -10,12 +10,15 @@
 #include <link.h>
 #include <pwd.h>
 #include <sys/stat.h>
+#include <sys/xattr.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
+#include <list>
+#include <map>
 #include <set>
 #include <system_error>
 
@@ -56,26 +59,41 @@ std::string GroupName(gid_t group) {
   return entry != nullptr ? entry->gr_name : std::to_string(group);
 }
 
-// Such as "the group staff may write /usr/local/lib"; empty when only root and the caller may.
+// Another user or group may then write, even if the mode of the file grants that only to its group.
+bool HasAccessControlList(fs::path const& path) { return ::getxattr(path.c_str(), "system.posix_acl_access", nullptr, 0) >= 0; }
+
+// Such as "the group staff may write /usr/local/lib"; empty when only root and the caller may. A symbolic link is not followed.
 std::string WhoElseMayWrite(fs::path const& path) {
   struct stat status {};
-  if (::stat(path.c_str(), &status) != 0) return "";
+  if (::lstat(path.c_str(), &status) != 0) return path.string() + " cannot be checked: " + TextOfError(errno);
   if (status.st_uid != 0 && status.st_uid != ::getuid()) return "the user " + UserName(status.st_uid) + " owns " + path.string();
+  if (S_ISLNK(status.st_mode)) return "";  // nobody can write it, and its mode has no meaning
   if (S_ISDIR(status.st_mode) && (status.st_mode & S_ISVTX) != 0) return "";
   if ((status.st_mode & S_IWOTH) != 0) return "every user may write " + path.string();
-  if ((status.st_mode & S_IWGRP) != 0 && status.st_gid != 0)
-    return "the group " + GroupName(status.st_gid) + " may write " + path.string();
-  return "";
+  if ((status.st_mode & S_IWGRP) == 0) return "";
+  if (status.st_gid != 0) return "the group " + GroupName(status.st_gid) + " may write " + path.string();
+  return HasAccessControlList(path) ? "others may write " + path.string() + " by its access control list" : "";
 }
 
-// The same for the file and every directory above it, on the way to it with and without symbolic links.
+// The same for everything on the way to the file: each directory, each symbolic link, and the file itself.
 std::string WhoElseMayReplace(fs::path const& file) {
-  std::error_code ignored;
-  for (fs::path const& way : {fs::absolute(file).lexically_normal(), fs::canonical(file, ignored)})
-    for (fs::path at = way; !at.empty(); at = at.has_relative_path() ? at.parent_path() : fs::path()) {
-      std::string const who = WhoElseMayWrite(at);
-      if (!who.empty()) return who;
+  constexpr int kMostLinks = 40;  // as many as Linux follows
+  fs::path const start = fs::absolute(file);
+  std::list<fs::path> names(start.begin(), start.end());  // the names that lie ahead; "/" leads back to the root
+  int links = 0;
+  for (fs::path at; !names.empty();) {
+    fs::path const next = (at / names.front()).lexically_normal();  // no link is above it, so that ".." is the directory above
+    names.pop_front();
+    std::string const who = WhoElseMayWrite(next);
+    if (!who.empty()) return who;
+    if (fs::is_symlink(fs::symlink_status(next))) {
+      if (++links > kMostLinks) return next.string() + " cannot be checked: " + TextOfError(ELOOP);
+      fs::path const target = fs::read_symlink(next);
+      names.insert(names.begin(), target.begin(), target.end());
+    } else {
+      at = next;
     }
+  }
   return "";
 }
 

@@ -38,9 +38,9 @@ struct TPlugInChoice {
   // Plug-ins to try without installing them, with any file name. One with the name of an installed plug-in takes its place.
   std::vector<std::string> fFiles = {};
 
-  // Whether root also loads plug-ins that others may write: the file, or a directory above it, belongs to a user other than root
-  // and the caller, or has permissions to write for its group (unless that is root's) or for everyone. A directory with the
-  // sticky bit, such as /tmp, protects what is in it.
+  // Whether root also loads plug-ins that others may replace: the file, or a directory or symbolic link on the way to it, belongs
+  // to a user other than root and the caller; or the file or a directory has permissions to write for its group (unless that is
+  // root's), for everyone, or by an access control list. A directory with the sticky bit, such as /tmp, protects its entries.
   bool fAllowWritable = false;
 };
 

@@ -3,12 +3,14 @@
 
 #include "tests/Support.h"
 
-#include <gtest/gtest.h>
+#include <gmock/gmock.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/un.h>
+#include <sys/xattr.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <cstring>
 
 namespace NQRVZEP20 {
@@ -107,6 +109,64 @@ TEST_F(PlugInFilesTest, TheTargetOfALinkIsCheckedToo) {
   EXPECT_EQ(RuleOf(fDir.Path("libFan.nsp.so")), "");
   ::chmod(fDir.Path("open").c_str(), 0777);
   EXPECT_EQ(RuleOf(fDir.Path("libFan.nsp.so")), "writable");
+}
+
+TEST_F(PlugInFilesTest, TheOwnerOfALinkIsChecked) {
+  NEEDS(::geteuid() == 0, "root");
+  Copy("a/libFan.nsp.so");
+  std::string const link = fDir.Path("sticky/libFan.nsp.so");
+  fs::create_directory(fDir.Path("sticky"));
+  ::chmod(fDir.Path("sticky").c_str(), 01777);
+  fs::create_symlink("../a/libFan.nsp.so", link);
+  EXPECT_EQ(RuleOf(link), "");
+  ASSERT_EQ(::lchown(link.c_str(), 1, 1), 0);
+  EXPECT_THAT(Tried(link).fReason, testing::MatchesRegex("it would run as root, but the user .+ owns " + link));
+}
+
+TEST_F(PlugInFilesTest, EveryLinkOfAChainIsCheckedWithItsDirectories) {
+  NEEDS(::geteuid() == 0, "root");
+  Copy("a/libFan.nsp.so");
+  std::string const middle = fDir.Path("b/middle"), first = fDir.Path("a/libFirst.nsp.so");
+  fs::create_directory(fDir.Path("b"));
+  fs::create_symlink("../a/libFan.nsp.so", middle);
+  fs::create_symlink("../b/middle", first);
+  EXPECT_EQ(RuleOf(first), "");
+  ASSERT_EQ(::lchown(middle.c_str(), 1, 1), 0);
+  EXPECT_EQ(RuleOf(first), "writable") << "the link in the middle belongs to another user";
+  ASSERT_EQ(::lchown(middle.c_str(), 0, 0), 0);
+  ::chmod(fDir.Path("b").c_str(), 0777);
+  EXPECT_EQ(Tried(first).fReason, "it would run as root, but every user may write " + fDir.Path("b"));
+}
+
+TEST_F(PlugInFilesTest, ADirectoryBehindALinkIsCheckedWithThoseAboveIt) {
+  NEEDS(::geteuid() == 0, "root");
+  Copy("b/c/libFan.nsp.so");
+  fs::create_directory_symlink(fDir.Path("b/c"), fDir.Path("a"));
+  EXPECT_EQ(RuleOf(fDir.Path("a/libFan.nsp.so")), "");
+  ::chmod(fDir.Path("b").c_str(), 0777);
+  EXPECT_EQ(Tried(fDir.Path("a/libFan.nsp.so")).fReason, "it would run as root, but every user may write " + fDir.Path("b"));
+}
+
+TEST_F(PlugInFilesTest, AnAccessControlListLetsOthersWrite) {
+  NEEDS(::geteuid() == 0, "root");
+  // version 2; then the tag, the permissions and the ID of: owner rwx, user 65534 rwx, group r-x, mask rwx, others r-x
+  std::string const list(
+      "\x02\0\0\0"
+      "\x01\0\x07\0\xff\xff\xff\xff"
+      "\x02\0\x07\0\xfe\xff\0\0"
+      "\x04\0\x05\0\xff\xff\xff\xff"
+      "\x10\0\x07\0\xff\xff\xff\xff"
+      "\x20\0\x05\0\xff\xff\xff\xff",
+      44);
+  std::string const file = Copy("a/libFan.nsp.so");
+  ::chmod(fDir.Path("a").c_str(), 0775);
+  EXPECT_EQ(RuleOf(file), "") << "its group is that of root";
+  int const status = ::setxattr(fDir.Path("a").c_str(), "system.posix_acl_access", list.data(), list.size(), 0);
+  NEEDS(status == 0 || errno != ENOTSUP, "a file system with access control lists");
+  ASSERT_EQ(status, 0) << std::strerror(errno);
+  EXPECT_EQ(Tried(file).fReason, "it would run as root, but others may write " + fDir.Path("a") + " by its access control list");
+  ::chmod(fDir.Path("a").c_str(), 0755);
+  EXPECT_EQ(RuleOf(file), "") << "the mask of the list permits nobody to write";
 }
 
 TEST_F(PlugInFilesTest, EveryFileOfTheDirectoryIsListedAfterTheTriedOnes) {
