@@ -151,6 +151,24 @@ TPlugInFile Tried(std::string const& name, bool allowWritable) {
   return {NameOfPlugIn(file.filename().string()), file.string(), ruling.fRule, ruling.fReason};
 }
 
+// In the order given. A file that is given twice is in the result once.
+std::vector<TPlugInFile> TriedOnes(TPlugInChoice const& choice) {
+  std::vector<TPlugInFile> files;
+  std::set<std::string> known;
+  for (std::string const& name : choice.fFiles) {
+    TPlugInFile file = Tried(name, choice.fAllowWritable);
+    if (known.insert(file.fFile).second) files.push_back(std::move(file));
+  }
+  return files;
+}
+
+// A file that is passed over anyway keeps its reason.
+void Replace(TPlugInFile& file, std::string const& reason) {
+  if (!file.IsLoaded()) return;
+  file.fRule = EPlugInRule::kReplaced;
+  file.fReason = reason;
+}
+
 std::vector<fs::path> FilesOfDirectory(std::string const& directory) {
   std::vector<fs::path> files;
   try {
@@ -172,18 +190,16 @@ std::string NameOf(EPlugInRule rule) {
 std::string PlugInDirectory() { return fs::path(TOSSpecific::GetZEPRootPath()).lexically_normal().string(); }
 
 std::vector<TPlugInFile> FindPlugIns(TPlugInChoice const& choice) {
-  std::vector<TPlugInFile> files;
-  std::set<std::string> tried;  // the names of plug-ins
-  for (std::string const& file : choice.fFiles) {
-    files.push_back(Tried(file, choice.fAllowWritable));
-    tried.insert(files.back().fName);
-  }
+  std::vector<TPlugInFile> files = TriedOnes(choice);
+  std::map<std::string, std::string> tried;  // the first file of each name
+  for (TPlugInFile& file : files)
+    if (auto const [first, isFirst] = tried.emplace(file.fName, file.fFile); !isFirst)
+      Replace(file, "a plug-in of the same name is tried before it: " + first->second);
   for (fs::path const& path : FilesOfDirectory(PlugInDirectory())) {
     files.push_back(Installed(path, choice.fAllowWritable));
     TPlugInFile& file = files.back();
     if (!file.IsLoaded() || tried.count(file.fName) == 0) continue;
-    file.fRule = EPlugInRule::kReplaced;
-    file.fReason = "a plug-in of the same name is tried in its place";
+    Replace(file, "a plug-in of the same name is tried in its place");
     file.fIsMeant = false;
   }
   return files;

@@ -14,7 +14,7 @@ enum class EPlugInRule {
   kKind,        // it is not a regular file, but for example a directory or a FIFO
   kPermission,  // this process may not read it
   kWritable,    // this process runs as root, and other users may replace the file
-  kReplaced     // a plug-in of the same name is tried in its place
+  kReplaced     // a plug-in of the same name is tried in its place, or before it
 };
 
 // For programs: "name", "missing", "kind", "permission", "writable" and "replaced"; empty for kNone.
@@ -35,7 +35,8 @@ struct TPlugInFile {
 };
 
 struct TPlugInChoice {
-  // Plug-ins to try without installing them, with any file name. One with the name of an installed plug-in takes its place.
+  // Plug-ins to try without installing them, with any file name. One with the name of an installed plug-in takes its place; of
+  // several with one name, the first one is loaded. A file that is given twice counts once.
   std::vector<std::string> fFiles = {};
 
   // Whether root also loads plug-ins that others may replace: the file, or a directory or symbolic link on the way to it, belongs

@@ -149,41 +149,50 @@ std::string FileNameOf(TPlugIn const& plugIn) { return plugIn.fFile.substr(plugI
 // ---- Names that more than one plug-in registers ----
 
 struct TClaim {
-  std::string fFile;
+  TPlugIn const* fPlugIn;
   TProviderRun* fRun;
 };
 
-std::string TakenBy(TClaim const& claim) { return "the name " + claim.fRun->fName + " is already registered by " + claim.fFile; }
+// The name of the claim's file, or its path if the file of the other claim has the same name.
+std::string FileOf(TClaim const& claim, TClaim const& other) {
+  std::string const name = FileNameOf(*claim.fPlugIn);
+  return name == FileNameOf(*other.fPlugIn) ? claim.fPlugIn->fFile : name;
+}
 
-// The name belongs to the first file whose provider has not failed. The rows of the others name it, and so does the row of the
-// first file, if its provider has failed.
+std::string TakenBy(TClaim const& claim, TClaim const& other) {
+  return "the name " + claim.fRun->fName + " is already registered by " + FileOf(claim, other);
+}
+
+// The name belongs to the first plug-in whose provider has not failed. The rows of the others name it, and so does the row of the
+// first plug-in, if its provider has failed.
 void Settle(std::vector<TClaim> const& claims) {
   TClaim const& first = claims.front();
   auto const hasView = [](TClaim const& claim) { return claim.fRun->fView != nullptr; };
   auto const owner = std::find_if(claims.begin(), claims.end(), hasView);
   for (TClaim const& claim : claims) {
     TProviderRun& run = *claim.fRun;
-    if (claim.fFile == first.fFile) continue;
+    if (claim.fPlugIn == first.fPlugIn) continue;
     if (!hasView(claim)) {
-      run.fError += "; " + TakenBy(first);
-    } else if (claim.fFile != owner->fFile) {
+      run.fError += "; " + TakenBy(first, claim);
+    } else if (claim.fPlugIn != owner->fPlugIn) {
       run.fView.reset();
-      run.fError = TakenBy(*owner);
+      run.fError = TakenBy(*owner, claim);
       run.fStage = NameOf(EStage::kRegistration);
     }
   }
-  auto const second = std::find_if(claims.begin(), claims.end(), [&](TClaim const& claim) { return claim.fFile != first.fFile; });
+  auto const second =
+      std::find_if(claims.begin(), claims.end(), [&](TClaim const& claim) { return claim.fPlugIn != first.fPlugIn; });
   if (second == claims.end() || hasView(first)) return;
-  bool const isOwner = owner != claims.end() && owner->fFile != first.fFile;
+  bool const isOwner = owner != claims.end() && owner->fPlugIn != first.fPlugIn;
   TClaim const& other = isOwner ? *owner : *second;
-  first.fRun->fError +=
-      "; the name " + first.fRun->fName + " is then registered by " + other.fFile + (isOwner ? ", which is used instead" : "");
+  first.fRun->fError += "; the name " + first.fRun->fName + " is then registered by " + FileOf(other, first) +
+                        (isOwner ? ", which is used instead" : "");
 }
 
 void SettleNames(std::vector<TPlugIn>& plugIns) {
   std::map<std::string, std::vector<TClaim>> claims;  // in the order of the plug-ins, by the names of providers
   for (TPlugIn& plugIn : plugIns)
-    for (TProviderRun& run : plugIn.fProviders) claims[run.fName].push_back({FileNameOf(plugIn), &run});
+    for (TProviderRun& run : plugIn.fProviders) claims[run.fName].push_back({&plugIn, &run});
   for (auto const& [name, ofName] : claims) Settle(ofName);
 }
 

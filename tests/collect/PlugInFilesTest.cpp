@@ -169,6 +169,19 @@ TEST_F(PlugInFilesTest, AnAccessControlListLetsOthersWrite) {
   EXPECT_EQ(RuleOf(file), "") << "the mask of the list permits nobody to write";
 }
 
+TEST_F(PlugInFilesTest, OfSeveralTriedPlugInsWithOneNameTheFirstIsLoaded) {
+  std::string const first = Copy("a/libFan.nsp.so"), second = Copy("b/libFan.nsp.so");
+  std::vector<TPlugInFile> const files = FindPlugIns({{first, second, first, "/nowhere/libFan.nsp.so"}});
+  EXPECT_EQ(files[0].fFile, first);
+  EXPECT_TRUE(files[0].IsLoaded());
+  EXPECT_EQ(files[1].fFile, second);
+  EXPECT_EQ(NameOf(files[1].fRule), "replaced");
+  EXPECT_EQ(files[1].fReason, "a plug-in of the same name is tried before it: " + first);
+  EXPECT_TRUE(files[1].fIsMeant);
+  EXPECT_EQ(NameOf(files[2].fRule), "missing") << "the file that is given twice counts once";
+  EXPECT_EQ(fs::path(files[3].fFile).parent_path(), PlugInDirectory());
+}
+
 TEST_F(PlugInFilesTest, EveryFileOfTheDirectoryIsListedAfterTheTriedOnes) {
   std::string const host = Copy("libHost.nsp.so");
   std::vector<TPlugInFile> const files = FindPlugIns({{host}});

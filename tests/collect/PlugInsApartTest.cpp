@@ -365,6 +365,21 @@ TEST_F(PlugInsApartMisdeedTest, OfTwoProvidersWithOneNameBothAreNamedWhenTheSeco
                               "(fill, libTwinThrows.nsp.so)"));
 }
 
+TEST_F(PlugInsApartMisdeedTest, OfTwoFilesWithOneNameThePathIsNamed) {
+  std::vector<TPlugInFile> files;
+  for (char const* directory : {"a", "b"}) {
+    fs::create_directory(fDir.Path(directory));
+    files.push_back({"Healthy", fDir.Path(std::string(directory) + "/libHealthy.nsp.so")});
+    fs::copy(MISBEHAVES, files.back().fFile);
+  }
+  std::vector<TPlugIn> const plugIns = LoadPlugInsApart(files);
+  ASSERT_EQ(plugIns.size(), 2u);
+  EXPECT_FALSE(plugIns[0].HasFailed());
+  ASSERT_EQ(plugIns[1].fProviders.size(), 1u);
+  EXPECT_EQ(plugIns[1].fProviders[0].fError, "the name Healthy is already registered by " + files[0].fFile);
+  EXPECT_EQ(plugIns[1].fProviders[0].fView, nullptr);
+}
+
 TEST_F(PlugInsApartMisdeedTest, AProviderThatIsRegisteredDuringTheFillIsNotFilled) {
   Add({"RegistersLate"});
   TLines const lines = List("");

@@ -153,6 +153,25 @@ TEST_F(PluginsTest, APlugInThatIsTriedTakesThePlaceOfTheInstalledOne) {
   EXPECT_TRUE(isReplaced);
 }
 
+TEST_F(PluginsTest, OfTwoTriedPlugInsWithOneNameTheFirstIsLoadedAndBothAreNamed) {
+  std::vector<std::string> files;
+  for (char const* directory : {"a", "b"}) {
+    fs::create_directory(fZep.Path(directory));
+    files.push_back(fZep.Path(std::string(directory) + "/libTest.nsp.so"));
+    fs::copy(TEST_PROVIDER, files.back());
+  }
+  TRun const run = Run({"plugins", "--json", "--plugin", files[0], "--plugin", files[1]});
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_EQ(JsonOf(run)["files"][0]["loaded"], true);
+  EXPECT_EQ(JsonOf(run)["files"][1]["rule"], "replaced");
+  EXPECT_EQ(run.fErrors, "zep: " + files[1] + ": passed over: a plug-in of the same name is tried before it: " + files[0] + "\n");
+
+  TRun const twice = Run({"plugins", "--json", "--plugin", files[0], "--plugin", files[0]});
+  EXPECT_EQ(twice.fStatus, 0) << twice.fErrors;
+  EXPECT_EQ(JsonOf(twice)["files"][0]["file"], files[0]);
+  EXPECT_NE(JsonOf(twice)["files"][1]["file"], files[0]);
+}
+
 TEST_F(PluginsTest, ATriedPlugInThatIsMissingCostsItsOwnRow) {
   TRun const run = Run({"report", "--sample", "--plugin", "/nowhere/libGone.nsp.so"});
   EXPECT_EQ(run.fStatus, 2);
