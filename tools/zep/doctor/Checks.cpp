@@ -122,7 +122,8 @@ std::vector<TCheck> CheckPlugIns(std::vector<TPlugIn> const& plugIns, std::strin
   std::vector<TCheck> checks;
   for (TPlugIn const& plugIn : plugIns) {
     std::string const name = "plug-in " + plugIn.fName;
-    std::vector<std::string> const failures = FailuresOf({plugIn});
+    std::vector<std::string> failures = FailuresOf({plugIn});
+    if (failures.empty() && plugIn.fProviders.empty()) failures.push_back("it registers no provider");
     checks.push_back(failures.empty() ? Works(name, plugIn.fFile)
                                       : Fails(name, Joined(failures, "; "), "mend " + plugIn.fFile + ", or remove it"));
   }

@@ -81,6 +81,12 @@ TEST_F(DoctorTest, EveryPlugInIsLoadedApart) {
   EXPECT_EQ(Check("plug-in Host")["works"], true);
 }
 
+TEST_F(DoctorTest, APlugInThatRegistersNothingDoesNotWork) {
+  fZep.Add("libRegistersNothing.nsp.so", FAULTY);
+  EXPECT_EQ(Check("plug-in RegistersNothing")["works"], false);
+  EXPECT_EQ(Check("plug-in RegistersNothing")["finding"], "it registers no provider");
+}
+
 TEST_F(DoctorTest, APlugInThatTurnsTheDebugLogOnIsNoticed) {
   fZep.Add("libTest.nsp.so", TEST_PROVIDER);
   EXPECT_EQ(Check("log threshold")["works"], true);

@@ -111,12 +111,14 @@ TEST(ChecksTest, EachPlugInHasACheck) {
   TPlugIn good{"Good", "/p/libGood.nsp.so", 1, "", {{"Good", nullptr, 1, ""}}};
   TPlugIn bad{"Bad", "/p/libBad.nsp.so", 1, "no such symbol", {}};
   bad.fStage = "open";
-  std::vector<TCheck> const checks = CheckPlugIns({good, bad}, "/p");
-  ASSERT_EQ(checks.size(), 2u);
+  TPlugIn const empty{"Empty", "/p/libEmpty.nsp.so", 1, "", {}};
+  std::vector<TCheck> const checks = CheckPlugIns({good, bad, empty}, "/p");
+  ASSERT_EQ(checks.size(), 3u);
   EXPECT_EQ(checks[0].fName, "plug-in Good");
   EXPECT_EQ(TextOf(checks[0]), "works: /p/libGood.nsp.so");
   EXPECT_EQ(checks[1].fName, "plug-in Bad");
   EXPECT_EQ(TextOf(checks[1]), "Bad: no such symbol (open, libBad.nsp.so) -> mend /p/libBad.nsp.so, or remove it");
+  EXPECT_EQ(TextOf(checks[2]), "it registers no provider -> mend /p/libEmpty.nsp.so, or remove it");
 
   std::vector<TCheck> const none = CheckPlugIns({}, "/p");
   ASSERT_EQ(none.size(), 1u);
