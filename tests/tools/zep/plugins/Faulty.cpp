@@ -124,6 +124,14 @@ std::map<std::string, TFill> const kFills = {
        std::vector<TCIMValue> const texts = {"a", "\xff"};
        AddThing(ns, {{"Id", "1"}, {"Text", TCIMValue(TCIMValue::TCIMType::kCIMTypeString, 0, texts)}}, "string[]");
      }},
+    {"HasBytesInAQualifier",
+     [](TMemoryNamespace& ns) { ns.DefineClass("X_Thing").Description("a\xff").Key("Id", "string").Description("b\xff"); }},
+    {"HasBytesInADefault",
+     [](TMemoryNamespace& ns) { ns.DefineClass("X_Thing").Key("Id", "string").Property("Text", "string", TCIMValue("a\xff")); }},
+    {"HasBytesInAMethod",
+     [](TMemoryNamespace& ns) {
+       ns.DefineClass("X_Thing").Key("Id", "string").Method("Stop", "uint32").In("Reason", "string").Description("a\xff");
+     }},
     {"IsInfinite",
      [](TMemoryNamespace& ns) {
        AddThing(ns, {{"Id", "1"}, {"Text", std::numeric_limits<double>::infinity()}}, "real64");
@@ -166,13 +174,19 @@ void Fill(TMemoryNamespace& ns) {
     AddThing(ns, {{"Id", "1"}, {"Text", "one"}});
 }
 
+std::string NameOfNamespace() {
+  if (OwnName() == "HasUnnamedNamespace") return "";
+  return OwnName() == "HasBytesInNamespace" ? "root/\xff" : "root/faulty";
+}
+
 void Register(std::string const& name) {
   TNamespaceProviderManager::GetInstance()->RegisterNamespaceProvider(
-      boost::make_shared<TMemoryProvider>(name, "root/faulty", Fill));
+      boost::make_shared<TMemoryProvider>(name, NameOfNamespace(), Fill));
 }
 
 std::string NameToRegister() {
   if (OwnName() == "RegistersHost") return "Host";
+  if (OwnName() == "RegistersUnnamed") return "";
   return OwnName() == "RegistersAnother" ? "Another" : OwnName();
 }
 

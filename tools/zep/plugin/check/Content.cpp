@@ -3,8 +3,11 @@
 
 #include "CIMNames.h"
 #include "ICIMInstance.h"
+#include "ICIMMethodDecl.h"
+#include "ICIMParameterDecl.h"
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
+#include "ICIMQualifier.h"
 #include "KeyText.h"
 #include "TCIMReference.h"
 #include "collect/ClassTree.h"
@@ -95,10 +98,57 @@ void AddDeclarations(ICIMClass const& cls, std::vector<TDeclaration>& declaratio
       kNone);
 }
 
+using TDeclaredValues = std::vector<TDeclaredValue>;
+
+void AddQualifiers(ICIMNamedElement const& element, std::string const& place, TDeclaredValues& values) {
+  element.EnumerateQualifiers(
+      [&](boost::shared_ptr<ICIMQualifier> const& qualifier) {
+        values.push_back({place + ", qualifier " + qualifier->GetName(kNone), qualifier->GetValue(kNone)});
+        return true;
+      },
+      kNone);
+}
+
+void AddValuesOfProperties(ICIMClass const& cls, std::string const& place, TDeclaredValues& values) {
+  cls.EnumeratePropertyDecls(
+      [&](boost::shared_ptr<ICIMPropertyDecl> const& decl) {
+        std::string const placeOfDecl = place + "." + decl->GetName(kNone);
+        values.push_back({placeOfDecl + ", default value", decl->GetDefaultValue(kNone)});
+        AddQualifiers(*decl, placeOfDecl, values);
+        return true;
+      },
+      kNone);
+}
+
+void AddValuesOfMethods(ICIMClass const& cls, std::string const& place, TDeclaredValues& values) {
+  cls.EnumerateMethodDecls(
+      [&](boost::shared_ptr<ICIMMethodDecl> const& decl) {
+        std::string const placeOfDecl = place + "." + decl->GetName(kNone) + "()";
+        AddQualifiers(*decl, placeOfDecl, values);
+        decl->EnumerateParameterDecls(
+            [&](boost::shared_ptr<ICIMParameterDecl> const& parameter) {
+              AddQualifiers(*parameter, placeOfDecl + ", parameter " + parameter->GetName(kNone), values);
+              return true;
+            },
+            kNone);
+        return true;
+      },
+      kNone);
+}
+
+TDeclaredValues DeclaredValuesOf(ICIMClass const& cls) {
+  TDeclaredValues values;
+  std::string const place = cls.GetName(kNone);
+  AddQualifiers(cls, place, values);
+  AddValuesOfProperties(cls, place, values);
+  AddValuesOfMethods(cls, place, values);
+  return values;
+}
+
 }  // namespace
 
 TClassContent ContentOf(ICIMClass const& cls) {
-  TClassContent content{cls.GetName(kNone), {}, {}, cls.IsAbstract(kNone)};
+  TClassContent content{cls.GetName(kNone), {}, {}, cls.IsAbstract(kNone), DeclaredValuesOf(cls)};
   AddDeclarations(cls, content.fDeclarations);
   for (auto super = cls.GetSuperClass(kNone); super; super = super->GetSuperClass(kNone)) {
     content.fSuperClasses.push_back(super->GetName(kNone));

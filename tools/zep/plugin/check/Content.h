@@ -23,11 +23,18 @@ struct TDeclaration {
   bool fIsKey;
 };
 
+// The default value of a declaration, or the value of a qualifier.
+struct TDeclaredValue {
+  std::string fPlace;  // such as "X_Disk.Size, default value" or "X_Disk, qualifier Description"
+  TCIMValue fValue;
+};
+
 struct TClassContent {
   std::string fName;
   std::vector<std::string> fSuperClasses;   // the nearest first
   std::vector<TDeclaration> fDeclarations;  // with those of the superclasses; of several of a name, only the nearest
   bool fIsAbstract;
+  std::vector<TDeclaredValue> fDeclaredValues;  // of the class, its properties, methods and parameters, without superclasses
 };
 
 struct TPropertyContent {

@@ -113,9 +113,19 @@ void CheckValue(TPlaced const& placed, TRuleResult& result) {
     CheckScalar({placed.fPlace + "[" + std::to_string(at) + "]", placed.fIsKey, elements[at]}, result);
 }
 
+// A provider and a namespace may have any name in UTF-8.
+void CheckFreeName(std::string const& place, std::string const& name, TRuleResult& result) {
+  if (name.empty()) return result.Find(place, "the name is empty", "give it a name");
+  if (!IsUtf8(name))
+    result.Find(place, "the name \"" + WithBytesEscaped(name) + "\" has bytes that are zero or not UTF-8", "use UTF-8");
+}
+
 void CheckTextsIn(TContent const& content, TRuleResult& result) {
+  CheckFreeName("provider " + content.fProvider, content.fProvider, result);
+  CheckFreeName("namespace " + content.fNamespace, content.fNamespace, result);
   for (TClassContent const& cls : content.fClasses) {
     CheckNameOf("class " + cls.fName, cls.fName, result);
+    for (TDeclaredValue const& declared : cls.fDeclaredValues) CheckValue({declared.fPlace, false, declared.fValue}, result);
     for (TDeclaration const& declaration : cls.fDeclarations)
       CheckNameOf(cls.fName + "." + declaration.fName, declaration.fName, result);
   }

@@ -157,6 +157,12 @@ TEST_F(CheckTest, AFaultOfTheContentsIsFoundByItsRule) {
            {"HasBytes", "text", "root/faulty:X_Thing.Id=\"1\".Text", "\"a\\xff\" has bytes"},
            {"HasZero", "text", "root/faulty:X_Thing.Id=\"a\\x00b\".Id", "\"a\\x00b\" has bytes"},
            {"HasBytesInAList", "text", "root/faulty:X_Thing.Id=\"1\".Text[1]", "\"\\xff\" has bytes"},
+           {"HasBytesInAQualifier", "text", "X_Thing, qualifier Description", "\"a\\xff\" has bytes"},
+           {"HasBytesInADefault", "text", "X_Thing.Text, default value", "\"a\\xff\" has bytes"},
+           {"HasBytesInAMethod", "text", "X_Thing.Stop(), parameter Reason, qualifier Description", "\"a\\xff\" has bytes"},
+           {"HasUnnamedNamespace", "text", "namespace", "the name is empty"},
+           {"HasBytesInNamespace", "text", "namespace", "the name \"root/\\xff\" has bytes"},
+           {"HasBytes\xff", "text", "provider", "the name \"HasBytes\\xff\" has bytes"},
            {"IsInfinite", "text", "root/faulty:X_Thing.Id=\"1\".Text", "inf is not a number in JSON"},
            {"HasWrongType", "schema", "CIM_Thing.State", "its type is string, in the schema uint16", withSchema},
            {"HasWrongKey", "schema", "CIM_Thing.State", "it is a key, but not in the schema", withSchema},
@@ -212,6 +218,12 @@ TEST_F(CheckTest, TwoInstancesWithOnePathAreFound) {
   EXPECT_EQ(finding["place"], "root/faulty:X_Thing.Id=\"1\",Size=\"0.123457\"");
   EXPECT_EQ(finding["text"], "instances with this path: 2");
   EXPECT_EQ(RuleOf(document, "text")["found"], 2);
+}
+
+TEST_F(CheckTest, AProviderWithoutANameIsFound) {
+  nlohmann::json const document = DocumentOf(Faulty("libRegistersUnnamed.nsp.so"));
+  EXPECT_EQ(FoundIn(document), (TNames{"registration", "text"})) << document.dump(2);
+  EXPECT_EQ(RuleOf(document, "text")["findings"][0]["text"], "the name is empty");
 }
 
 TEST_F(CheckTest, AKeyOfTheSchemaThatIsMissingIsFound) {
