@@ -150,7 +150,7 @@ void TPlugInProcess::ReadAnswer() {
         return End(EEnding::kBadAnswer);
     }
   });
-  if (!fAnswerEnd && !fGiveUpAt) fGiveUpAt = TClock::now() + kGrace;
+  if (!fAnswerEnd && !fGiveUpAt) fGiveUpAt = std::min(TClock::now() + kGrace, NextDeadline());
 }
 
 // Once.
@@ -191,13 +191,9 @@ void TPlugInProcess::End(EEnding ending) {
 }
 
 void TPlugInProcess::CheckDeadlines() {
-  TClock::time_point const now = TClock::now();
-  if (fEnding == EEnding::kNone) {
-    if (fDeadline && now >= *fDeadline) return End(EEnding::kTimeUp);
-    if (fGiveUpAt && now >= *fGiveUpAt) End(EEnding::kClosed);
-  } else if (now >= *fGiveUpAt) {  // the supervisor is stopped, or a process waits for a device and cannot be ended
-    Complete();
-  }
+  if (TClock::now() < NextDeadline()) return;
+  if (fEnding == EEnding::kNone) return End(fGiveUpAt ? EEnding::kClosed : EEnding::kTimeUp);
+  Complete();  // the supervisor is stopped, or a process waits for a device and cannot be ended
 }
 
 void TPlugInProcess::Complete() {

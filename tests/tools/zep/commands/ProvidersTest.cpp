@@ -191,6 +191,14 @@ TEST_F(ProvidersTest, PlugInsThatHangOrStopAreEndedAtTheTimeLimit) {
   ExpectNoProcess("HangsBlocked");
 }
 
+TEST_F(ProvidersTest, AClosedDescriptorIsNamedEvenIfTheTimeLimitIsShort) {
+  fZep.Remove("libHost.nsp.so");
+  Add({"Closes"});
+  auto const failure = FailureIn(JsonOf(Run({"report", "--json", "--plugin-timeout", "5"})), "Closes");
+  EXPECT_EQ(failure["error"], "it closed the descriptor for its result");
+  EXPECT_EQ(failure["stage"], "fill");
+}
+
 TEST_F(ProvidersTest, APlugInThatFillsMemoryIsEndedAtTheMemoryLimit) {
   if (kIsSanitized) GTEST_SKIP() << "a sanitizer reserves more address space than any limit";
   Add({"FillsMemory"});
