@@ -2,6 +2,7 @@
 #include "collect/answer/TRecordedFailure.h"
 
 #include "TZEPFailure.h"
+#include "collect/FailureOf.h"
 #include "collect/SafeText.h"
 #include "collect/answer/AnswerLimits.h"
 #include "collect/answer/TBadAnswer.h"
@@ -34,7 +35,7 @@ TRecordedFailure TRecordedFailure::OfCurrentException() {
     recorded.fCode = failure.GetStatusCode().GetCode();
   } catch (std::exception const& failure) {
     recorded.fKind = kText;
-    recorded.fText = failure.what();
+    recorded.fText = TextOf(failure);
   } catch (...) {
     recorded.fKind = kOther;
   }

@@ -90,10 +90,11 @@ void OnExit(int status, void*) {
 // For an exception that nothing can catch: of a static constructor, a thread or a function that is declared not to throw.
 [[noreturn]] void OnTerminate() {
   if (IsCopy()) ::_exit(1);
-  std::string why = "it called std::terminate";
-  if (auto const thrown = std::current_exception()) why = FailureOf([&] { std::rethrow_exception(thrown); });
+  auto const thrown = std::current_exception();
+  TTimedFailure failure;
+  if (thrown) failure = TimedFailureOf([&] { std::rethrow_exception(thrown); });
   FlushWords();
-  Send(EMessage::kFatal, why);
+  Send(EMessage::kFatal, thrown ? failure.MessageAndReason() : "it called std::terminate");
   ::_exit(1);
 }
 
@@ -202,8 +203,8 @@ void Serialise(ICIMNamespace const& ns, bool isMeasured) {
   for (TClassCost const& cost : meter.Finish()) Send(EMessage::kCost, BytesOf(cost));
 }
 
-void Fill(INamespaceProvider& provider, bool isMeasured) {
-  Send(EMessage::kFilling, provider.GetName(TCIMContext()));
+void Fill(std::string const& name, INamespaceProvider& provider, bool isMeasured) {
+  Send(EMessage::kFilling, name);
   boost::shared_ptr<ICIMNamespace> ns;
   TTimedFailure failure = MeasuredFailureOf(isMeasured, [&] {
     ns = provider.GetNamespace(TCIMContext());
@@ -226,12 +227,12 @@ void SendTraces(std::map<int, std::string> const& openBefore) {
 
 }  // namespace
 
-void RunPlugIn(TChildSetup const& setup) {
+void RunPlugIn(TChildSetup const& setup) noexcept {
   SetUp(setup);
   auto const openBefore = setup.fMeasures ? OpenDescriptors() : std::map<int, std::string>();
   auto const registry = WatchRegistry();
   Load(setup);
-  for (auto const& provider : registry->NewProviders()) Fill(*provider, setup.fMeasures);
+  for (auto const& [name, provider] : registry->NewProviders()) Fill(name, *provider, setup.fMeasures);
   if (setup.fMeasures) SendTraces(openBefore);
   FlushWords();
   Send(EMessage::kDone, "");

@@ -20,7 +20,8 @@ struct TChildSetup {
 // Loads the plug-in into this process, calls its providers to fill their namespaces, and sends the result. Then exits.
 //
 // Standard input is the null device, no other descriptors are open, the log goes to `fLog`, and no core dump is written.
-// Handlers that were registered with atexit before this call do not run, even if the plug-in calls exit.
-[[noreturn]] void RunPlugIn(TChildSetup const& setup);
+// Handlers that were registered with atexit before this call do not run, even if the plug-in calls exit. An exception that
+// nothing catches ends the process, and is sent as the reason.
+[[noreturn]] void RunPlugIn(TChildSetup const& setup) noexcept;
 
 }  // namespace NQRVZEP20

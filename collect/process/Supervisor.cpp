@@ -72,8 +72,9 @@ public:
   TVerdict const& Verdict() const { return fVerdict; }
 
 private:
+  // A traced child that stops has a status, too.
   void Note(pid_t ended, int status) {
-    if (ended != fChild) return;
+    if (ended != fChild || WIFSTOPPED(status)) return;
     fHasEnded = true;
     fVerdict.fStatus = status;
   }
@@ -98,7 +99,7 @@ void Send(int fd, TVerdict const& verdict) { [[maybe_unused]] ssize_t const sent
 
 }  // namespace
 
-void Supervise(TSupervisorEnds const& ends, std::function<void()> const& work) {
+void Supervise(TSupervisorEnds const& ends, std::function<void()> const& work) noexcept {
   ::setsid();
   ResetSignals();
   ::prctl(PR_SET_CHILD_SUBREAPER, 1);

@@ -26,7 +26,8 @@ struct TSupervisorEnds {
 // supervisor.
 //
 // Supervisor and child each have a session of their own, so a Ctrl-C on the terminal reaches neither. In the child, all signals
-// have their default disposition and none is blocked; `work` must close the descriptors that it does not need.
-[[noreturn]] void Supervise(TSupervisorEnds const& ends, std::function<void()> const& work);
+// have their default disposition and none is blocked; `work` must close the descriptors that it does not need. An exception ends
+// the process that throws it.
+[[noreturn]] void Supervise(TSupervisorEnds const& ends, std::function<void()> const& work) noexcept;
 
 }  // namespace NQRVZEP20

@@ -70,6 +70,7 @@ TPlugInProcess::TPlugInProcess(std::string const& name, std::string const& file,
 }
 
 TPlugInProcess::~TPlugInProcess() {
+  if (::getpid() != fOwner) return;
   fControl.reset();
   if (fVerdictEnd) HasInput(fVerdictEnd.get(), kTimeToEnd);
   EndSupervisor();
@@ -84,11 +85,12 @@ void TPlugInProcess::Start(TApartLimits const& limits, bool measures) {
                           log.fWriteEnd.get(),
                           limits.fMemoryMebibytes * 1024 * 1024,
                           measures};
+  TSupervisorEnds const ends{control.fReadEnd.get(), verdict.fWriteEnd.get(), {setup.fAnswer, setup.fWords, setup.fLog}};
+  std::function<void()> const work = [&] { RunPlugIn(setup); };
   fSupervisor = ForkOrThrow();
   if (fSupervisor == 0) {
     control.fWriteEnd.release();  // closed with all others, so that the end of the owner is seen
-    Supervise({control.fReadEnd.get(), verdict.fWriteEnd.get(), {setup.fAnswer, setup.fWords, setup.fLog}},
-              [&] { RunPlugIn(setup); });
+    Supervise(ends, work);
   }
   fControl = std::move(control.fWriteEnd);
   fAnswerEnd = std::move(answer.fReadEnd);

@@ -11,6 +11,7 @@
 
 #include <poll.h>
 #include <sys/types.h>
+#include <unistd.h>
 
 #include <chrono>
 #include <optional>
@@ -20,7 +21,8 @@
 namespace NQRVZEP20 {
 
 // The owner's handle for the process of one plug-in and its supervisor. The owner polls the descriptors and calls Follow. If
-// the process is still running when the handle is destroyed, it is killed. The calling process must be single-threaded.
+// the process is still running when the handle is destroyed, it is killed; a copy of the handle in a forked process does not kill
+// it. The calling process must be single-threaded.
 class TPlugInProcess {
 public:
   using TClock = TPlugInAnswer::TClock;
@@ -72,6 +74,7 @@ private:
 
   TApartLimits const fLimits;
   TPlugIn fResult;  // only names until the end
+  pid_t const fOwner = ::getpid();
   pid_t fSupervisor = -1;
   TUniqueFd fControl, fAnswerEnd, fWordsEnd, fLogEnd, fVerdictEnd;  // below 0 when closed
 

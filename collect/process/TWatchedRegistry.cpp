@@ -1,16 +1,25 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/process/TWatchedRegistry.h"
 
+#include "TZEPFailure.h"
+
 namespace NQRVZEP20 {
 
 TWatchedRegistry::TWatchedRegistry(boost::shared_ptr<TNamespaceProviderManager> registry, TEvents events)
-    : fRegistry(registry), fEvents(std::move(events)) {}
+    : fRegistry(registry), fEvents(std::move(events)) {
+  fRegistry->EnumerateNamespaceProviders([this](boost::shared_ptr<INamespaceProvider> provider) {
+    fTaken.insert(provider->GetName(TCIMContext()));
+    return true;
+  });
+}
 
 void TWatchedRegistry::RegisterNamespaceProvider(boost::shared_ptr<INamespaceProvider> provider) {
   fEvents.fBegins();
-  std::string const name = provider->GetName(TCIMContext());  // for an empty pointer, a failed assertion
-  if (Has(name)) return fEvents.fIsTaken(name);
+  if (!provider) throw TZEPFailure(kZEPStatusFail, "it registers an empty pointer");
+  std::string const name = provider->GetName(TCIMContext());
+  if (fTaken.count(name) != 0) return fEvents.fIsTaken(name);
   fRegistry->RegisterNamespaceProvider(provider);
+  fTaken.insert(name);
   fNew[name] = provider;
   fEvents.fEnds(name);
 }
@@ -21,21 +30,6 @@ boost::shared_ptr<INamespaceProvider> TWatchedRegistry::GetNamespaceProvider(std
 
 void TWatchedRegistry::EnumerateNamespaceProviders(boost::function<bool(boost::shared_ptr<INamespaceProvider>)> callback) {
   fRegistry->EnumerateNamespaceProviders(callback);
-}
-
-std::vector<boost::shared_ptr<INamespaceProvider>> TWatchedRegistry::NewProviders() const {
-  std::vector<boost::shared_ptr<INamespaceProvider>> providers;
-  for (auto const& [name, provider] : fNew) providers.push_back(provider);
-  return providers;
-}
-
-bool TWatchedRegistry::Has(std::string const& name) const {
-  bool isTaken = false;
-  fRegistry->EnumerateNamespaceProviders([&](boost::shared_ptr<INamespaceProvider> provider) {
-    isTaken = provider->GetName(TCIMContext()) == name;
-    return !isTaken;
-  });
-  return isTaken;
 }
 
 }  // namespace NQRVZEP20

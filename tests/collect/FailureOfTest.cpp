@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <new>
 #include <stdexcept>
 
 namespace NQRVZEP20 {
@@ -22,6 +23,15 @@ TEST(FailureOfTest, NamesWhatWasThrown) {
 TEST(FailureOfTest, ObjectsThatAreNotExceptionsAreCaught) {
   EXPECT_EQ(FailureOf([] { throw std::runtime_error(""); }), "it threw an exception without a text");
   EXPECT_EQ(FailureOf([] { throw 5; }), "it threw an object that is not a std::exception");
+}
+
+struct TNoText : std::exception {
+  char const* what() const noexcept override { return nullptr; }
+};
+
+TEST(FailureOfTest, TheTextOfAnExceptionMayBeMissing) {
+  EXPECT_EQ(FailureOf([] { throw TNoText(); }), "it threw an exception without a text");
+  EXPECT_EQ(FailureOf([] { throw std::bad_alloc(); }), "std::bad_alloc");
 }
 
 }  // namespace

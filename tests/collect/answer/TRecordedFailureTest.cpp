@@ -29,6 +29,14 @@ TEST(TRecordedFailureTest, EveryKindIsThrownAgain) {
   EXPECT_EQ(FailureOf([] { ReadAgain([] { throw 5; }).Throw(); }), "it threw an object that is not a std::exception");
 }
 
+struct TNoText : std::exception {
+  char const* what() const noexcept override { return nullptr; }
+};
+
+TEST(TRecordedFailureTest, AnExceptionWithoutATextRemainsOne) {
+  EXPECT_EQ(FailureOf([] { ReadAgain([] { throw TNoText(); }).Throw(); }), "it threw an exception without a text");
+}
+
 TEST(TRecordedFailureTest, ALongTextIsCut) {
   auto const failure = ReadAgain([] { throw std::runtime_error(std::string(5000, 'x')); });
   EXPECT_EQ(FailureOf([&] { failure.Throw(); }), std::string(1021, 'x') + "...");

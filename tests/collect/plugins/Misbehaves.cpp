@@ -17,6 +17,7 @@
 #include <fcntl.h>
 #include <sys/mman.h>
 #include <sys/prctl.h>
+#include <sys/ptrace.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
@@ -26,9 +27,11 @@
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <fstream>
 #include <iostream>
 #include <map>
+#include <new>
 #include <stdexcept>
 #include <thread>
 
@@ -83,6 +86,17 @@ void FillMemory() {
     for (std::size_t at = 0; at < size; at += 4096) piece[at] = 1;
   }
 }
+
+// Uses up the smallest pieces, too.
+void LeakAndThrow() {
+  for (std::size_t size = 1024 * 1024; size > 0; size = size > 1024 ? size / 2 : size - 8)
+    while (void* const piece = ::operator new(size, std::nothrow)) std::memset(piece, 1, size);
+  throw 42;
+}
+
+struct TNoText : std::exception {
+  char const* what() const noexcept override { return nullptr; }
+};
 
 // ---- The supervisor and the pipe of the answer ----
 
@@ -220,11 +234,15 @@ std::map<std::string, TMisdeed> const kWhileLoading = {
 
 std::map<std::string, TMisdeed> const kWhileFilling = {
     {"Throws", [] { Log("the disk is gone"), throw TZEPFailure(kZEPStatusAccessDenied, "no disk"); }},
+    {"ThrowsNullText", [] { throw TNoText(); }},
+    {"Dawdles", [] { ::sleep(2); }},
     {"ThrowsInAThread", [] { std::thread([] { throw std::runtime_error("in a thread"); }).join(); }},
     {"ThrowsWhileItMayNot", []() noexcept { ThrowHere("it may not"); }},
     {"Crashes", [] { Log("about to crash"), Crash(); }},
     {"CrashesAfterWords", [] { std::cout << "last words" << std::endl, Crash(); }},
     {"Aborts", [] { std::abort(); }},
+    {"ExitsQuickly", [] { std::quick_exit(4); }},
+    {"Terminates", [] { std::terminate(); }},
     {"Exits", [] { std::exit(0); }},
     {"ExitsAtOnce", [] { ::_exit(7); }},
     {"Executes", [] { ::execl("/bin/sh", "sh", "-c", "exit 9", nullptr); }},
@@ -238,6 +256,7 @@ std::map<std::string, TMisdeed> const kWhileFilling = {
        LeaveProcessId("HangsBlocked");
        HangHere();
      }},
+    {"IsTraced", [] { ::ptrace(PTRACE_TRACEME, 0, nullptr, nullptr), ::raise(SIGUSR1); }},
     {"Stops", [] { ::raise(SIGSTOP); }},
     {"Kills", [] { ::kill(0, SIGTERM); }},
     {"FillsMemory", FillMemory},
@@ -283,14 +302,22 @@ public:
   std::string const& GetName(TCIMContext const& context) const override {
     if (OwnName() == "RegistrationThrows") throw std::runtime_error("it has no name");
     if (OwnName() == "RegistrationHangs") HangHere();
+    if (OwnName() == "NameThrowsAtOnce" && fNames > 0) throw std::runtime_error("it has no second name");
+    if (OwnName() == "NameThrowsLater" && fNames > 1) throw std::runtime_error("it has no third name");
+    ++fNames;
     return TMemoryProvider::GetName(context);
   }
   boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) override {
     if (OwnName() == "AnswersForever") return NamespaceWith<TEndlessClass>(1024 * 1024);
     if (OwnName() == "AnswersLate") return TMemoryProvider::GetNamespace(context), NamespaceWith<TMemoryClass>(32 * 1024 * 1024);
     if (OwnName() == "AnswersBroken") return NamespaceWith<TBrokenClass>(0);
+    if (OwnName() == "HasNoNamespace") return {};
+    if (OwnName() == "LeaksAndThrows") LeakAndThrow();  // here, where no namespace is freed
     return TMemoryProvider::GetNamespace(context);
   }
+
+private:
+  mutable int fNames = 0;  // how often the name was returned
 };
 
 void Register(std::string const& name) {
@@ -303,6 +330,8 @@ struct TRegistration {
     auto const misdeed = kWhileLoading.find(OwnName());
     if (misdeed != kWhileLoading.end()) misdeed->second();
     if (OwnName() == "RegistersNothing") return;
+    if (OwnName() == "RegistersNull") TNamespaceProviderManager::GetInstance()->RegisterNamespaceProvider({});
+    if (OwnName() == "HasAnOddName") Register("odd \xff");
     bool const isTwin = OwnName().rfind("Twin", 0) == 0;
     Register(isTwin ? "Twin" : OwnName());
     if (OwnName() == "RegistersTwice") Register(OwnName());

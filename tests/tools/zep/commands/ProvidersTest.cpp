@@ -108,6 +108,9 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
       {"Crashes", "fill", "it was killed by SIGSEGV (Segmentation fault)", "[Error] about to crash"},
       {"Aborts", "fill", "it was killed by SIGABRT (Aborted)", nullptr},
       {"Exits", "fill", "it exited with status 0", nullptr},
+      {"ExitsQuickly", "fill", "it exited with status 4", nullptr},
+      {"Terminates", "fill", "it called std::terminate", nullptr},
+      {"HasNoNamespace", "fill", "it has no namespace", nullptr},
       {"ExitsAtOnce", "fill", "it exited with status 7", nullptr},
       {"Kills", "fill", "it was killed by SIGTERM (Terminated)", nullptr},
       {"KillsItsSupervisor", "fill", "its supervisor process died", nullptr},
@@ -117,6 +120,7 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
       {"LoadCrashes", "static construction", "it was killed by SIGSEGV (Segmentation fault)", nullptr},
       {"LoadExits", "static construction", "it exited with status 3", nullptr},
       {"RegistrationThrows", "registration", "it has no name", nullptr},
+      {"RegistersNull", "registration", "kZEPStatusFail (it registers an empty pointer)", nullptr},
   };
   for (TRow const& row : rows) Add({row.fName});
   Add({"ChangesDirectory", "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken"});
@@ -134,8 +138,57 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
   }
   for (char const* name : {"ChangesDirectory", "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken"})
     EXPECT_TRUE(FailureIn(document, name)["error"].is_null()) << name;
+  EXPECT_EQ(FailureIn(document, "AnswersBroken")["namespace"], "root/own");
+  EXPECT_THAT(document["instanceFailures"],
+              Contains(nlohmann::json{{"provider", "AnswersBroken"}, {"error", "kZEPStatusTypeMismatch"}}));
   ExpectNoProcess("Forks");
   ExpectNoProcess("KillsItsSupervisor");
+}
+
+// The healthy plug-in is at work when the other one fails.
+TEST_F(ProvidersTest, AFailureThatIsHardToReportLeavesOtherPlugInsAlone) {
+  struct TRow {
+    char const *fName, *fStage, *fError;
+    bool fNeedsMemoryLimit;
+  } const rows[] = {
+      {"ThrowsNullText", "fill", "it threw an exception without a text", false},
+      {"NameThrowsAtOnce", "registration", "it has no second name", false},
+      {"LeaksAndThrows", "fill", "std::bad_alloc (the memory limit is 64 MiB)", true},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.fName);
+    if (row.fNeedsMemoryLimit && kIsSanitized) continue;  // a sanitizer reserves more address space than any limit
+    Add({"Dawdles", row.fName});
+    std::vector<std::string> arguments = {"report", "--json"};
+    if (row.fNeedsMemoryLimit) arguments.insert(arguments.end(), {"--plugin-memory", "64"});
+    TRun const run = Run(arguments);
+    EXPECT_EQ(run.fStatus, 2);
+    auto const failure = FailureIn(JsonOf(run), row.fName);
+    EXPECT_EQ(failure["error"], row.fError);
+    EXPECT_EQ(failure["stage"], row.fStage);
+    EXPECT_TRUE(FailureIn(JsonOf(run), "Dawdles")["error"].is_null());
+    fZep.Remove("lib" + std::string(row.fName) + ".nsp.so");
+  }
+}
+
+TEST_F(ProvidersTest, ANameThatIsNotUtf8IsShownWithReplacements) {
+  Add({"HasAnOddName"});
+  TRun const run = Run({"report", "--json"});
+  EXPECT_EQ(run.fStatus, 0);
+  auto const document = JsonOf(run);
+  std::vector<std::string> names;
+  for (auto const& plugIn : document["plugIns"])
+    for (auto const& provider : plugIn["providers"]) names.push_back(provider["name"]);
+  EXPECT_THAT(names, Contains("odd \xef\xbf\xbd"));
+}
+
+TEST_F(ProvidersTest, TheNameOfAProviderIsReadWhenItIsRegistered) {
+  Add({"Dawdles", "NameThrowsLater"});
+  for (char const* name : {"Dawdles", "NameThrowsLater"}) {
+    TRun const run = Run({"show", "X_" + std::string(name)});
+    EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+    EXPECT_THAT(run.fOutput, HasSubstr("X_" + std::string(name)));
+  }
 }
 
 TEST_F(ProvidersTest, OfTwoPlugInsWithOneNameBothAreNamed) {
@@ -181,9 +234,9 @@ TEST_F(ProvidersTest, TheRowOfAFailureNamesFileProviderStageCauseAndLogLine) {
 
 TEST_F(ProvidersTest, PlugInsThatHangOrStopAreEndedAtTheTimeLimit) {
   fZep.Remove("libHost.nsp.so");
-  Add({"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs"});
+  Add({"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs", "IsTraced"});
   auto const document = JsonOf(Run({"report", "--json", "--plugin-timeout", "6"}));
-  for (char const* name : {"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs"})
+  for (char const* name : {"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs", "IsTraced"})
     EXPECT_EQ(FailureIn(document, name)["error"], "it exceeded the time limit of 6 s") << name;
   EXPECT_EQ(FailureIn(document, "LoadHangs")["stage"], "static construction");
   EXPECT_EQ(FailureIn(document, "RegistrationHangs")["stage"], "registration");
