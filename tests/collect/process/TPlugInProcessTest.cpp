@@ -24,6 +24,9 @@ TEST(TPlugInProcessTest, ACopyOfTheHandleInAForkedProcessDoesNotKill) {
     ::_exit(0);
   }
   ::waitpid(copy, nullptr, 0);
+  siginfo_t ended{};
+  ::waitid(P_PID, static_cast<id_t>(process->Supervisor()), &ended, WEXITED | WNOHANG | WNOWAIT);
+  EXPECT_EQ(ended.si_pid, 0) << "the supervisor has ended";
   while (!process->HasEnded()) {
     ::usleep(1000);
     process->Follow();
