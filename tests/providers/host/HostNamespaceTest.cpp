@@ -379,7 +379,7 @@ TEST_F(HostOfRootTest, HundredsOfCpusAreDescribedQuickly) {
   Fill(root.Path());
   std::chrono::duration<double, std::milli> const taken = std::chrono::steady_clock::now() - start;
   RecordProperty("milliseconds", std::to_string(taken.count()));
-  EXPECT_LT(taken.count(), 500);
+  EXPECT_LT(taken.count(), kIsSanitized ? 20000 : 2000);
   auto const count = [&](char const* className) {
     return All(*fNs->GetClass(className, kNone), &ICIMClass::EnumerateInstances).size();
   };
