@@ -190,8 +190,9 @@ void Load(TChildSetup const& setup) {
   bool const runsItsCode = CanBeMapped(setup.fFile);
   if (runsItsCode) SendStage(EStage::kConstruction);
   TTimedFailure const failure = MeasuredFailureOf(setup.fMeasures, [&] { LoadLibraryOf({setup.fName, setup.fFile}); });
-  if (IsOfLinker(failure)) SendStage(EStage::kOpen);
-  if (!failure.fMessage.empty()) Send(EMessage::kFailed, failure.ReasonOrMessage());
+  bool const isOfLinker = IsOfLinker(failure);
+  if (isOfLinker) SendStage(EStage::kOpen);
+  if (!failure.fMessage.empty()) Send(EMessage::kFailed, isOfLinker ? failure.fReason : failure.MessageAndReason());
   SendTime(EMessage::kLoaded, failure.fMilliseconds);
 }
 
