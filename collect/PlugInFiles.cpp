@@ -67,7 +67,7 @@ std::string WhoElseMayWrite(fs::path const& path) {
   struct stat status {};
   if (::lstat(path.c_str(), &status) != 0) return path.string() + " cannot be checked: " + TextOfError(errno);
   if (status.st_uid != 0 && status.st_uid != ::getuid()) return "the user " + UserName(status.st_uid) + " owns " + path.string();
-  if (S_ISLNK(status.st_mode)) return "";  // nobody can write it, and its mode has no meaning
+  if (S_ISLNK(status.st_mode)) return "";  // a link cannot be written, and its mode has no meaning
   if (S_ISDIR(status.st_mode) && (status.st_mode & S_ISVTX) != 0) return "";
   if ((status.st_mode & S_IWOTH) != 0) return "every user may write " + path.string();
   if ((status.st_mode & S_IWGRP) == 0) return "";

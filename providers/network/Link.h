@@ -99,7 +99,7 @@ public:
   }
 
   // The first word of each of these files in the directory, as "arp_validate: none". A file that this kernel lacks is left out;
-  // missing if there is none of them.
+  // missing if the kernel lacks all of them.
   template <std::size_t N>
   TFinding<std::vector<std::string>> Settings(std::string const& directory, char const* const (&names)[N]) const {
     std::vector<std::string> settings;

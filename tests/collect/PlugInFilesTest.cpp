@@ -166,7 +166,7 @@ TEST_F(PlugInFilesTest, AnAccessControlListLetsOthersWrite) {
   ASSERT_EQ(status, 0) << std::strerror(errno);
   EXPECT_EQ(Tried(file).fReason, "it would run as root, but others may write " + fDir.Path("a") + " by its access control list");
   ::chmod(fDir.Path("a").c_str(), 0755);
-  EXPECT_EQ(RuleOf(file), "") << "the mask of the list permits nobody to write";
+  EXPECT_EQ(RuleOf(file), "") << "the mask of the list does not permit writing";
 }
 
 TEST_F(PlugInFilesTest, OfSeveralTriedPlugInsWithOneNameTheFirstIsLoaded) {

@@ -82,8 +82,8 @@ void AddCheck(CLI::App& command, TArguments& arguments) {
   AddLimitOptions(command, arguments.fPlugIns);
   command.footer(
       "The plug-in is loaded twice, each time in a process of its own, and every rule is checked: its name, its symbols,\n"
-      "its registration, its keys and values, its classes against the schema, its time and memory, and everything that it\n"
-      "leaves behind or prints. docs/zep.md describes the rules. Without --mof the schema is searched as by zep plugin new.\n"
+      "its registration, its keys and values, its classes against the schema, its time and memory, and what it prints and\n"
+      "leaves open or running. docs/zep.md describes the rules. Without --mof the schema is searched as by zep plugin new.\n"
       "Exit status: 0 when no rule has found anything, 1 when one has or the plug-in cannot be checked, 64 for wrong usage.");
 }
 

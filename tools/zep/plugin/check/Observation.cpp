@@ -21,7 +21,7 @@ TTrial Try(TPlugInFile const& file, TPlugInArguments const& arguments) {
   return trial;
 }
 
-// A key that contains the time of day then differs from that of the first trial. The clock of time(2) lags behind by up to a tick
+// A key that contains the time of day then differs from that of the first trial. The clock of time(2) may be late by up to a tick
 // of the kernel.
 void WaitForNextSecond() {
   constexpr std::chrono::milliseconds kLongestLag(50);
