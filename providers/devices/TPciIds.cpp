@@ -1,21 +1,20 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TPciIds.h"
 
-extern "C" {
-#include <pci/pci.h>
-}
+#include <boost/interprocess/file_mapping.hpp>
+#include <boost/interprocess/mapped_region.hpp>
 
 #include <array>
 #include <cstdio>
-#include <stdexcept>
 
 namespace NQRVZEP20 {
 
 namespace {
 
-// libpci ends the process after an error unless the function that reports it does not return.
-__attribute__((noreturn)) void ThrowError(char* format, ...) { throw std::runtime_error(format); }
-void Ignore(char*, ...) {}
+namespace ipc = boost::interprocess;
+
+// Of Debian, and of Fedora and SUSE.
+constexpr char const* kLists[] = {"/usr/share/misc/pci.ids", "/usr/share/hwdata/pci.ids"};
 
 constexpr std::size_t kNames = 4;
 
@@ -45,45 +44,46 @@ TFinding<std::string> NameFrom(std::string const& line, char const* kind) {
 
 }  // namespace
 
-struct TPciIds::TAccess {
-  TAccess() : fAccess(::pci_alloc()) {
-    fAccess->error = ThrowError;
-    fAccess->warning = Ignore;
-    fAccess->debug = Ignore;
-  }
-  ~TAccess() { ::pci_cleanup(fAccess); }
-  TAccess(TAccess const&) = delete;
-  TAccess& operator=(TAccess const&) = delete;
+// The list is mapped: the system replaces the file when it updates the list, and never shortens it.
+struct TPciIds::TMappedList {
+  explicit TMappedList(char const* path)
+      : fRegion(ipc::file_mapping(path, ipc::read_only), ipc::read_only),
+        fList({static_cast<char const*>(fRegion.get_address()), fRegion.get_size()}) {}
 
-  // Empty if the list does not contain the numbers.
-  std::string Name(int kind, int a, int b = 0, int c = 0, int d = 0) {
-    char buffer[1024];
-    char const* const name =
-        ::pci_lookup_name(fAccess, buffer, sizeof buffer, kind | PCI_LOOKUP_NO_NUMBERS | PCI_LOOKUP_NO_HWDB, a, b, c, d);
-    return name != nullptr ? name : "";
+  // Null if the list cannot be read.
+  static std::unique_ptr<TMappedList> Open(char const* path) {
+    try {
+      return std::make_unique<TMappedList>(path);
+    } catch (ipc::interprocess_exception const&) {
+      return nullptr;
+    }
   }
 
-  pci_access* fAccess;
+  ipc::mapped_region fRegion;
+  TPciIdList fList;
 };
 
 TPciIds::TPciIds() = default;
 TPciIds::~TPciIds() = default;
 
 TPciNames TPciIds::NamesOf(TPciNumbers const& numbers, TMachineFiles const& files) {
-  auto const answer = files.Answer(AnswerName(numbers), [&]() -> TFinding<std::string> { return Lookup(numbers); });
+  auto const answer = files.Answer(AnswerName(numbers), [&] { return Lookup(numbers); });
   if (!answer) return {answer.Why(), answer.Why(), answer.Why(), answer.Why()};
   auto const lines = LinesOf(*answer);
   return {NameFrom(lines[0], "vendor"), NameFrom(lines[1], "device"), NameFrom(lines[2], "subsystem"),
           NameFrom(lines[3], "class")};
 }
 
-std::string TPciIds::Lookup(TPciNumbers const& n) {
-  if (!fAccess) fAccess = std::make_unique<TAccess>();
-  std::string lines = fAccess->Name(PCI_LOOKUP_VENDOR, n.fVendor) + "\n";
-  lines += fAccess->Name(PCI_LOOKUP_DEVICE, n.fVendor, n.fDevice) + "\n";
-  if (n.fSubsystemVendor != 0)
-    lines += fAccess->Name(PCI_LOOKUP_SUBSYSTEM | PCI_LOOKUP_DEVICE, n.fVendor, n.fDevice, n.fSubsystemVendor, n.fSubsystem);
-  return lines + "\n" + fAccess->Name(PCI_LOOKUP_CLASS, static_cast<int>(n.fClass >> 8)) + "\n";
+// In the order of LinesOf.
+TFinding<std::string> TPciIds::Lookup(TPciNumbers const& numbers) {
+  for (char const* const path : kLists)
+    if (!fList) fList = TMappedList::Open(path);
+  if (!fList)
+    return TMissing{kMissingUnreadable,
+                    "the list of PCI identifiers (pci.ids) is not installed; it is part of the package pci.ids"};
+  TPciIdList const& list = fList->fList;
+  std::string const subsystem = numbers.fSubsystemVendor != 0 ? list.SubsystemOf(numbers) : "";
+  return list.VendorOf(numbers) + "\n" + list.DeviceOf(numbers) + "\n" + subsystem + "\n" + list.ClassOf(numbers) + "\n";
 }
 
 }  // namespace NQRVZEP20

@@ -167,7 +167,7 @@ TEST_F(PciRecordsTest, ASlotHasItsAddress) {
   EXPECT_EQ(ValueIn(slots[0].fRecord, "PoweredOn"), "true");
 }
 
-// On this machine the names come from libpci. The numbers are those of a port that every version of the list contains.
+// The numbers are those of a port that every version of the list contains.
 TEST(TPciIdsTest, NamesComeFromTheList) {
   NEEDS(fs::exists("/usr/share/misc/pci.ids"), "the package pci.ids");
   TPciIds ids;
