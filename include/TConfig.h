@@ -3,11 +3,13 @@
 
 #include "ZEPExport.h"
 
-#include <map>
+#include <memory>
 #include <string>
 #include <vector>
 
 namespace NQRVZEP20 {
+
+class TSettings;
 
 // The settings file "zep.cfg" of the working directory: lines of the form KEY=VALUE, without sections, quotes or escapes.
 //
@@ -49,7 +51,7 @@ public:
   static TConfig* cfgInstance;  // null until GetInstance is first called
 
 private:
-  std::map<std::string, std::string> fSettings;
+  std::unique_ptr<TSettings> fSettings;  // never null
   std::string fFileName;
 };
 

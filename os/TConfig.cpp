@@ -4,16 +4,14 @@
 #include "TOSSpecific.h"
 #include "TZEPException.h"
 #include "core/Log.h"
-#include "os/SettingLine.h"
+#include "os/Settings.h"
 
-#include <algorithm>
-#include <cstdint>
 #include <exception>
 #include <fstream>
 #include <memory>
+#include <optional>
 #include <string_view>
 #include <utility>
-#include <vector>
 
 namespace NQRVZEP20 {
 namespace {
@@ -41,77 +39,6 @@ std::string LinesOf(std::istream& file) {
   return text;
 }
 
-// A setting of the file. The texts are parts of the text that was read.
-struct TSetting {
-  std::string_view fKey, fValue;
-};
-
-std::vector<TSetting> SettingsOf(std::string_view text) {
-  std::vector<TSetting> settings;
-  settings.reserve(static_cast<std::size_t>(std::count(text.begin(), text.end(), '\n')));
-  while (!text.empty()) {
-    std::size_t const end = text.find('\n');
-    TSettingLine const line = ReadSettingLine(text.substr(0, end));
-    text.remove_prefix(end + 1);
-    if (line.IsSetting()) settings.push_back({line.fKey, line.fValue});
-  }
-  return settings;
-}
-
-std::size_t LengthOfCommonStart(std::vector<TSetting> const& settings) {
-  if (settings.empty()) return 0;
-  std::string_view common = settings.front().fKey;
-  for (TSetting const& setting : settings) {
-    auto const end = std::mismatch(common.begin(), common.end(), setting.fKey.begin(), setting.fKey.end()).first;
-    common = common.substr(0, static_cast<std::size_t>(end - common.begin()));
-  }
-  return common.size();
-}
-
-// Eight bytes from a position, as a number with the same order. Bytes after the end are 0.
-std::uint64_t WordAt(std::string_view text, std::size_t at) {
-  std::uint64_t word = 0;
-  for (std::size_t i = at; i < at + 8; ++i) word = word << 8 | (i < text.size() ? static_cast<unsigned char>(text[i]) : 0u);
-  return word;
-}
-
-// A setting's place in the order of the keys: the sixteen bytes after the start that all keys share, then the whole key, then the
-// place in the file. The bytes nearly always decide, and the texts, which are far apart in memory, need not be read: that takes
-// half of the time for keys in any order.
-struct TPlace {
-  std::uint64_t fHead, fSecond;
-  TSetting const* fSetting;
-
-  TPlace(TSetting const& setting, std::size_t commonLength)
-      : fHead(WordAt(setting.fKey, commonLength)), fSecond(WordAt(setting.fKey, commonLength + 8)), fSetting(&setting) {}
-
-  bool operator<(TPlace const& other) const {
-    if (fHead != other.fHead) return fHead < other.fHead;
-    if (fSecond != other.fSecond) return fSecond < other.fSecond;
-    int const order = fSetting->fKey.compare(other.fSetting->fKey);
-    return order != 0 ? order < 0 : fSetting < other.fSetting;
-  }
-};
-
-bool IsSortedByKey(std::vector<TSetting> const& settings) {
-  auto const isBefore = [](TSetting const& left, TSetting const& right) { return left.fKey < right.fKey; };
-  return std::is_sorted(settings.begin(), settings.end(), isBefore);
-}
-
-// Sorts by key, and settings with the same key in the order of the file.
-void SortByKey(std::vector<TSetting>& settings) {
-  if (IsSortedByKey(settings)) return;
-  std::size_t const commonLength = LengthOfCommonStart(settings);
-  std::vector<TPlace> places;
-  places.reserve(settings.size());
-  for (TSetting const& setting : settings) places.emplace_back(setting, commonLength);
-  std::sort(places.begin(), places.end());
-  std::vector<TSetting> sorted;
-  sorted.reserve(settings.size());
-  for (TPlace const& place : places) sorted.push_back(*place.fSetting);
-  settings = std::move(sorted);
-}
-
 }  // namespace
 
 TConfig* TConfig::cfgInstance = nullptr;
@@ -121,7 +48,7 @@ TConfig* TConfig::GetInstance() {
   return cfgInstance;
 }
 
-TConfig::TConfig() : fFileName("zep.cfg") { parseConfigFile(); }
+TConfig::TConfig() : fSettings(std::make_unique<TSettings>()), fFileName("zep.cfg") { parseConfigFile(); }
 
 TConfig::~TConfig() {
   // The pointer is not cleared. Kept.
@@ -143,40 +70,34 @@ void TConfig::parseConfigFile() {
     LogError("TConfig::parseConfigFile(): Open config file ", fFileName, " failed");
     return;
   }
-  std::string const text = LinesOf(file);
+  std::string text = LinesOf(file);
   if (file.bad()) {  // a part of the file is not used
     LogError("TConfig::parseConfigFile(): Read config file ", fFileName, " failed");
     return;
   }
-  std::vector<TSetting> settings = SettingsOf(text);
-  SortByKey(settings);  // a map inserts sorted settings without a search
-  for (TSetting const& setting : settings)
-    fSettings.try_emplace(fSettings.end(), std::string(setting.fKey), setting.fValue);  // the first setting of a key is kept
+  fSettings->Add(std::move(text));
 }
 
 std::string TConfig::getValue(std::string const& key) {
-  if (fSettings.empty()) {
+  if (fSettings->IsEmpty()) {
     LogError("TConfig::getValue(): map is empty");
     return "";
   }
-  auto const setting = fSettings.find(key);
-  if (setting == fSettings.end()) {
+  std::optional<std::string_view> const value = fSettings->ValueOf(key);
+  if (!value) {
     LogError("TConfig::getValue(): key not found");
     return "";
   }
-  LogDebug("TConfig::getValue(): key ", key, " found, value is ", setting->second);
-  return setting->second;
+  LogDebug("TConfig::getValue(): key ", key, " found, value is ", *value);
+  return std::string(*value);
 }
 
 std::vector<std::string> TConfig::listKeys() {
-  if (fSettings.empty()) {
+  if (fSettings->IsEmpty()) {
     LogError("TConfig::getValue(): map is empty");  // names getValue, although this is listKeys. Kept.
     return {};
   }
-  std::vector<std::string> keys;
-  keys.reserve(fSettings.size());
-  for (auto const& setting : fSettings) keys.push_back(setting.first);
-  return keys;
+  return fSettings->Keys();
 }
 
 }  // namespace NQRVZEP20

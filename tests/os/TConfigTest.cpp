@@ -109,6 +109,31 @@ TEST_F(TConfigTest, ASecondReadAddsOnlyMissingKeys) {
   EXPECT_EQ(SettingsOf(config), (TSettings{{"a", "1"}, {"b", "2"}, {"c", "3"}, {"d", "4"}}));
 }
 
+TEST_F(TConfigTest, ManyKeysOfTwoReadsAreFoundAndOthersAreNot) {
+  std::mt19937 random(11);
+  auto const randomKey = [&] { return "setting." + std::to_string(random() % 50000); };
+  std::map<std::string, std::string> expected;
+  auto const writeFile = [&](std::string const& value) {
+    std::string text;
+    for (int i = 0; i < 20000; ++i) {
+      std::string const key = randomKey();
+      text += key + "=" + value + std::to_string(i) + "\n";
+      expected.emplace(key, value + std::to_string(i));
+    }
+    WriteFile("zep.cfg", text);
+  };
+  writeFile("first");
+  TConfig config;
+  writeFile("second");
+  config.parseConfigFile();
+  EXPECT_EQ(SettingsOf(config), TSettings(expected.begin(), expected.end()));
+  for (int i = 0; i < 1000; ++i) {
+    std::string const key = randomKey();
+    auto const setting = expected.find(key);
+    EXPECT_EQ(config.getValue(key), setting == expected.end() ? "" : setting->second) << key;
+  }
+}
+
 TEST_F(TConfigTest, LogsThatItReads) {
   WriteFile("zep.cfg", "a=1\n");
   EXPECT_EQ(LogOf([] { TConfig config; }), (TEntries{kStart}));
