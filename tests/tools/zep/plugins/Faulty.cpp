@@ -128,6 +128,8 @@ std::map<std::string, TFill> const kFills = {
      [](TMemoryNamespace& ns) { ns.DefineClass("X_Thing").Description("a\xff").Key("Id", "string").Description("b\xff"); }},
     {"HasBytesInADefault",
      [](TMemoryNamespace& ns) { ns.DefineClass("X_Thing").Key("Id", "string").Property("Text", "string", TCIMValue("a\xff")); }},
+    {"HasBytesInAStatic",
+     [](TMemoryNamespace& ns) { ns.DefineClass("X_Thing").Key("Id", "string").Static("Text", "string", TCIMValue("a\xff")); }},
     {"HasBytesInAMethod",
      [](TMemoryNamespace& ns) {
        ns.DefineClass("X_Thing").Key("Id", "string").Method("Stop", "uint32").In("Reason", "string").Description("a\xff");

@@ -120,6 +120,16 @@ void AddValuesOfProperties(ICIMClass const& cls, std::string const& place, TDecl
       kNone);
 }
 
+// Of the class itself, without superclasses, as every other declared value.
+void AddValuesOfStaticProperties(ICIMClass const& cls, std::string const& place, TDeclaredValues& values) {
+  cls.EnumerateStaticProperties(
+      [&](boost::shared_ptr<ICIMProperty> const& property) {
+        values.push_back({place + "." + property->GetName(kNone) + ", static value", property->GetValue(kNone)});
+        return true;
+      },
+      kNone);
+}
+
 void AddValuesOfMethods(ICIMClass const& cls, std::string const& place, TDeclaredValues& values) {
   cls.EnumerateMethodDecls(
       [&](boost::shared_ptr<ICIMMethodDecl> const& decl) {
@@ -141,6 +151,7 @@ TDeclaredValues DeclaredValuesOf(ICIMClass const& cls) {
   std::string const place = cls.GetName(kNone);
   AddQualifiers(cls, place, values);
   AddValuesOfProperties(cls, place, values);
+  AddValuesOfStaticProperties(cls, place, values);
   AddValuesOfMethods(cls, place, values);
   return values;
 }

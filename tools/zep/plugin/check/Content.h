@@ -23,7 +23,7 @@ struct TDeclaration {
   bool fIsKey;
 };
 
-// The default value of a declaration, or the value of a qualifier.
+// The default value of a declaration, or the value of a static property or of a qualifier.
 struct TDeclaredValue {
   std::string fPlace;  // such as "X_Disk.Size, default value" or "X_Disk, qualifier Description"
   TCIMValue fValue;

@@ -159,6 +159,7 @@ TEST_F(CheckTest, AFaultOfTheContentsIsFoundByItsRule) {
            {"HasBytesInAList", "text", "root/faulty:X_Thing.Id=\"1\".Text[1]", "\"\\xff\" has bytes"},
            {"HasBytesInAQualifier", "text", "X_Thing, qualifier Description", "\"a\\xff\" has bytes"},
            {"HasBytesInADefault", "text", "X_Thing.Text, default value", "\"a\\xff\" has bytes"},
+           {"HasBytesInAStatic", "text", "X_Thing.Text, static value", "\"a\\xff\" has bytes"},
            {"HasBytesInAMethod", "text", "X_Thing.Stop(), parameter Reason, qualifier Description", "\"a\\xff\" has bytes"},
            {"HasUnnamedNamespace", "text", "namespace", "the name is empty"},
            {"HasBytesInNamespace", "text", "namespace", "the name \"root/\\xff\" has bytes"},
