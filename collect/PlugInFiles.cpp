@@ -3,6 +3,8 @@
 
 #include "TOSSpecific.h"
 #include "TZEPException.h"
+#include "TZEPFailure.h"
+#include "collect/process/SharedObject.h"
 #include "core/Handles.h"
 
 #include <fcntl.h>
@@ -212,6 +214,8 @@ bool IsElfFile(std::string const& file) {
 }
 
 void LoadLibraryOf(TPlugInFile const& plugIn) {
+  std::string const other = WhyOfOtherProcessor(plugIn.fFile);
+  if (!other.empty()) throw TZEPFailure(kZEPStatusFileSystemError, other);
   fs::path const file = plugIn.fFile;
   if (file.parent_path() == PlugInDirectory() && HasNameOfPlugIn(file.filename().string()))
     TOSSpecific::LoadNSPLibrary(plugIn.fName);

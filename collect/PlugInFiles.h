@@ -56,7 +56,7 @@ std::vector<TPlugInFile> FindPlugIns(TPlugInChoice const& choice = {});
 bool IsElfFile(std::string const& file);
 
 // Loads the library of the plug-in into this process, as TOSSpecific::LoadNSPLibrary and LoadPluginLibrary do, with their
-// exceptions.
+// exceptions. The reason of a file for another type of processor is that (WhyOfOtherProcessor in process/SharedObject.h).
 void LoadLibraryOf(TPlugInFile const& plugIn);
 
 }  // namespace NQRVZEP20

@@ -56,6 +56,30 @@ std::optional<ElfW(Ehdr)> HeaderOf(TFile const& file) {
   return header->front();
 }
 
+// ---- The type of processor ----
+
+// In the byte order of this machine; none for a file that is not an ELF file. The number has one place in files of any word size.
+std::optional<ElfW(Half)> ProcessorOf(std::string const& fileName) {
+  auto const header = TFile(fileName).Read<Elf32_Ehdr>(0, 1);
+  if (!header || std::memcmp(header->front().e_ident, ELFMAG, SELFMAG) != 0) return std::nullopt;
+  constexpr unsigned char kOrder = __BYTE_ORDER__ == __ORDER_BIG_ENDIAN__ ? ELFDATA2MSB : ELFDATA2LSB;
+  ElfW(Half) const number = header->front().e_machine;
+  return header->front().e_ident[EI_DATA] == kOrder ? number : __builtin_bswap16(number);
+}
+
+std::string NameOfProcessor(ElfW(Half) number) {
+  constexpr struct {
+    ElfW(Half) fNumber;
+    char const* fName;
+  } kNames[] = {{EM_X86_64, "x86-64"}, {EM_386, "i386"}, {EM_AARCH64, "aarch64"}, {EM_ARM, "arm"},   {EM_RISCV, "riscv"},
+                {EM_PPC64, "ppc64"},   {EM_PPC, "ppc"},  {EM_S390, "s390"},       {EM_MIPS, "mips"}, {EM_SPARCV9, "sparc64"}};
+  for (auto const& known : kNames)
+    if (known.fNumber == number) return known.fName;
+  return "processor type " + std::to_string(number);
+}
+
+// ---- Symbols ----
+
 bool IsExported(ElfW(Sym) const& symbol) {
   unsigned char const binding = ELF64_ST_BIND(symbol.st_info), visibility = ELF64_ST_VISIBILITY(symbol.st_other);
   bool const isDefined = symbol.st_shndx != SHN_UNDEF && symbol.st_shndx != SHN_ABS;
@@ -86,6 +110,12 @@ bool CanBeMapped(std::string const& fileName) {
   return segments && std::all_of(segments->begin(), segments->end(), [&](ElfW(Phdr) const& segment) {
            return segment.p_type != PT_LOAD || file.Has(segment.p_offset, segment.p_filesz);
          });
+}
+
+std::string WhyOfOtherProcessor(std::string const& fileName) {
+  auto const ofFile = ProcessorOf(fileName), own = ProcessorOf("/proc/self/exe");
+  if (!ofFile || !own || *ofFile == *own) return "";
+  return "it is built for " + NameOfProcessor(*ofFile) + ", and this process for " + NameOfProcessor(*own);
 }
 
 std::optional<std::vector<std::string>> ExportedSymbols(std::string const& fileName) {

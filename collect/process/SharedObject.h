@@ -12,6 +12,10 @@ namespace NQRVZEP20 {
 // process dies while it loads such a file, the fault is in the file's own code.
 bool CanBeMapped(std::string const& fileName);
 
+// Why this process cannot load the ELF file, if that is built for another type of processor: "it is built for aarch64, and this
+// process for x86-64". Empty for any other file, and without /proc. The dynamic linker reports such a file as missing.
+std::string WhyOfOtherProcessor(std::string const& fileName);
+
 // The names of the symbols that the shared object defines for other libraries, as in its dynamic symbol table, without those that
 // the linker adds to every library. None if the file cannot be mapped or has no such table. No code of the file runs.
 std::optional<std::vector<std::string>> ExportedSymbols(std::string const& fileName);

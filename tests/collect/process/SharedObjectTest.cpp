@@ -3,6 +3,7 @@
 
 #include "tests/Support.h"
 
+#include <gmock/gmock.h>
 #include <sys/stat.h>
 
 #include <algorithm>
@@ -30,6 +31,23 @@ TEST(SharedObjectTest, APlugInThatIsCutOffCannotBeMapped) {
     WriteFile(dir.Path("cut"), plugIn.substr(0, size));
     EXPECT_FALSE(CanBeMapped(dir.Path("cut"))) << size;
   }
+}
+
+// The plug-in, with another type of processor or another word size in its header.
+TEST(SharedObjectTest, AFileForAnotherProcessorIsNamed) {
+  TTempDir const dir;
+  std::string const plugIn = ReadFile(TEST_PROVIDER);
+  EXPECT_EQ(WhyOfOtherProcessor(TEST_PROVIDER), "");
+  EXPECT_EQ(WhyOfOtherProcessor(dir.Path("missing")), "");
+  auto const whyWith = [&](char order, char high, char low) {
+    std::string changed = plugIn;
+    changed[5] = order, changed[18] = order == 1 ? low : high, changed[19] = order == 1 ? high : low;
+    WriteFile(dir.Path("changed"), changed);
+    return WhyOfOtherProcessor(dir.Path("changed"));
+  };
+  EXPECT_THAT(whyWith(1, 1, 0x77), testing::StartsWith("it is built for processor type 375, and this process for "));
+  EXPECT_THAT(whyWith(2, 0, 22), testing::StartsWith("it is built for s390, and this process for "));
+  EXPECT_THAT(whyWith(2, 0, 2), testing::StartsWith("it is built for processor type 2, and this process for "));
 }
 
 TEST(SharedObjectTest, ExportedSymbolsAreThoseOfTheDynamicSymbolTable) {

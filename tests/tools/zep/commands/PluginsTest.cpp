@@ -108,6 +108,20 @@ TEST_F(PluginsTest, AnUndefinedSymbolIsNamed) {
   EXPECT_THAT(EntryOf(JsonOf(run), "libLacks.nsp.so")["reason"], HasSubstr("undefined symbol: SymbolThatIsMissing(int)"));
 }
 
+TEST_F(PluginsTest, APlugInForAnotherProcessorIsNamed) {
+  std::string plugIn = ReadFile(TEST_PROVIDER);
+  plugIn[18] = 0x77, plugIn[19] = 0x01;  // the type of processor in an ELF header
+  WriteFile(fZep.Path("lib/libOther.nsp.so"), plugIn);
+  for (std::vector<std::string> const& options : {std::vector<std::string>{}, {"--in-process"}}) {
+    std::vector<std::string> arguments = {"plugins", "--json"};
+    arguments.insert(arguments.end(), options.begin(), options.end());
+    nlohmann::json const entry = EntryOf(JsonOf(Run(arguments)), "libOther.nsp.so");
+    EXPECT_EQ(entry["rule"], "failed");
+    EXPECT_EQ(entry["plugIn"]["stage"], "open");
+    EXPECT_THAT(entry["reason"], testing::ContainsRegex("it is built for processor type [0-9]+, and this process for "));
+  }
+}
+
 TEST_F(PluginsTest, OfTwoThatRegisterOneNameBothAreNamed) {
   fZep.Add("libA.nsp.so", TEST_PROVIDER);
   fZep.Add("libB.nsp.so", TEST_PROVIDER);
