@@ -2,6 +2,7 @@
 #include "collect/PlugIns.h"
 
 #include "INamespaceProvider.h"
+#include "TLogger.h"
 #include "TRootObject.h"
 #include "collect/process/EStage.h"
 #include "collect/process/SharedObject.h"
@@ -39,9 +40,12 @@ TProviderRun Fill(std::string const& name, boost::shared_ptr<INamespaceProvider>
   return run;
 }
 
+bool LogsDebug() { return TLogger::GetInstance()->GetLogThreshold() >= ILogger::kLogDebug; }
+
 TPlugIn Load(TPlugInFile const& file, std::string const& sampleLabel) {
   TPlugIn plugIn{file.fName, file.fFile, 0, "", {}};
   TProviders const before = RegisteredProviders();
+  bool const loggedDebug = LogsDebug();
   TTimedFailure const failure = TimedFailureOf([&] { LoadLibraryOf(file); });
   plugIn.fMilliseconds = failure.fMilliseconds;
   plugIn.fError = failure.ReasonOrMessage();
@@ -49,6 +53,7 @@ TPlugIn Load(TPlugInFile const& file, std::string const& sampleLabel) {
 
   for (auto const& [providerName, provider] : RegisteredProviders())
     if (before.count(providerName) == 0) plugIn.fProviders.push_back(Fill(providerName, provider, sampleLabel));
+  plugIn.fLogsDebug = LogsDebug() && !loggedDebug;
   return plugIn;
 }
 
@@ -78,7 +83,11 @@ std::vector<TPlugIn> LoadPlugIns(std::vector<TPlugInFile> const& files, std::opt
 
 std::vector<TPlugIn> LoadPlugIns(std::optional<TSample> const& sample) { return LoadPlugIns(FindPlugIns(), sample); }
 
-TPlugIn PassedOver(TPlugInFile const& file) { return {file.fName, file.fFile, 0, file.fReason, {}, NameOf(EStage::kOpen)}; }
+TPlugIn PassedOver(TPlugInFile const& file) {
+  TPlugIn plugIn{file.fName, file.fFile, 0, file.fReason, {}, NameOf(EStage::kOpen)};
+  plugIn.fRule = file.fRule;
+  return plugIn;
+}
 
 std::vector<TNamespaceView> ViewsOf(std::vector<TPlugIn> const& plugIns) {
   std::vector<TNamespaceView> views;

@@ -52,6 +52,7 @@ std::string ResultOf(std::string_view bytes, std::size_t pieceSize) {
     result += Row(run.fName, run.fError, run.fStage) + std::to_string(run.fPeakBytes) + "\n";
     for (TClassCost const& cost : run.fCosts) result += BytesOf(cost) + "\n";
   }
+  if (plugIn.fLogsDebug) result += "logs debug\n";
   result += TextOf(plugIn.fTraces);
   return result;
 }

@@ -24,6 +24,7 @@ enum class EMessage : unsigned char {
   kLeftOpen,     // a descriptor that the plug-in leaves open: its number and target. Sent before kTraced
   kLeftRunning,  // a process that the plug-in leaves running: its number and name. Sent before kTraced
   kTraced,       // all descriptors and processes that the plug-in leaves have been sent
+  kLogsDebug,    // the plug-in has set the log threshold so that debug entries are logged
   kDone          // nothing more follows; the last kind
 };
 

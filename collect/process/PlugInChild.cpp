@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/process/PlugInChild.h"
 
-#include "ILogger.h"
+#include "TLogger.h"
 #include "TRootObject.h"
 #include "collect/PlugInFiles.h"
 #include "collect/answer/NamespaceBytes.h"
@@ -226,14 +226,18 @@ void SendTraces(std::map<int, std::string> const& openBefore) {
   Send(EMessage::kTraced, "");
 }
 
+bool LogsDebug() { return TLogger::GetInstance()->GetLogThreshold() >= ILogger::kLogDebug; }
+
 }  // namespace
 
 void RunPlugIn(TChildSetup const& setup) noexcept {
   SetUp(setup);
+  bool const loggedDebug = LogsDebug();
   auto const openBefore = setup.fMeasures ? OpenDescriptors() : std::map<int, std::string>();
   auto const registry = WatchRegistry();
   Load(setup);
   for (auto const& [name, provider] : registry->NewProviders()) Fill(name, *provider, setup.fMeasures);
+  if (LogsDebug() && !loggedDebug) Send(EMessage::kLogsDebug, "");
   if (setup.fMeasures) SendTraces(openBefore);
   FlushWords();
   Send(EMessage::kDone, "");

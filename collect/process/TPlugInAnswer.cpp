@@ -67,6 +67,9 @@ void TPlugInAnswer::Take(TMessage const& message) {
     case EMessage::kTraced:
       fResult.fTraces = fTraces;
       return;
+    case EMessage::kLogsDebug:
+      fResult.fLogsDebug = true;
+      return;
     case EMessage::kDone:
       fState = EState::kDone;
       return;

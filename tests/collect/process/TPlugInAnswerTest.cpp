@@ -137,6 +137,7 @@ TEST_F(TPlugInAnswerTest, AnAnswerIsTheSameInPiecesOfAnySize) {
                                      {EMessage::kFilling, "A"},
                                      {EMessage::kBytes, kDisks},
                                      {EMessage::kFilled, "3500"},
+                                     {EMessage::kLogsDebug, ""},
                                      {EMessage::kDone, ""}});
   auto const answer = Answer();
   for (char const& byte : bytes) answer->Add({&byte, 1});
@@ -145,6 +146,7 @@ TEST_F(TPlugInAnswerTest, AnAnswerIsTheSameInPiecesOfAnySize) {
   EXPECT_DOUBLE_EQ(plugIn.fMilliseconds, 0.012);
   EXPECT_DOUBLE_EQ(plugIn.fProviders.at(0).fMilliseconds, 3.5);
   EXPECT_EQ(plugIn.fWords, "words");
+  EXPECT_TRUE(plugIn.fLogsDebug);
 }
 
 TEST_F(TPlugInAnswerTest, WhyAnAnswerIsRefusedIsKnown) {

@@ -40,7 +40,7 @@ std::string Path() {
 
 // The plug-ins come first: their processes are started before any library is loaded here.
 std::vector<TCheck> CheckAll(TPlugInArguments const& arguments) {
-  std::vector<TCheck> const plugIns = CheckPlugIns(LoadPlugInsFor(arguments, std::nullopt), PlugInDirectory());
+  std::vector<TPlugIn> const plugIns = LoadPlugInsFor(arguments, std::nullopt);
   std::vector<TCheck> checks = {CheckRoot(::geteuid() == 0),
                                 CheckSmbios(OpenSmbios()),
                                 CheckControllerDevice("/dev"),
@@ -48,8 +48,9 @@ std::vector<TCheck> CheckAll(TPlugInArguments const& arguments) {
                                 CheckProgram("hwinfo", Path(), "hwinfo"),
                                 CheckProgram("lsblk", Path(), "util-linux"),
                                 CheckLogDirectory(TLogger::GetLogFileDir()),
-                                CheckLogThreshold(TLogger::GetInstance()->GetLogThreshold())};
-  checks.insert(checks.end(), plugIns.begin(), plugIns.end());
+                                CheckLogThreshold(TLogger::GetInstance()->GetLogThreshold(), plugIns)};
+  std::vector<TCheck> const ofPlugIns = CheckPlugIns(plugIns, PlugInDirectory());
+  checks.insert(checks.end(), ofPlugIns.begin(), ofPlugIns.end());
   return checks;
 }
 

@@ -111,21 +111,47 @@ TCheck CheckLogDirectory(std::string const& directory) {
   return Works(kName, directory + (exists ? " can be written" : " can be created"));
 }
 
-TCheck CheckLogThreshold(ILogger::EZEPLogSeverity threshold) {
+TCheck CheckLogThreshold(ILogger::EZEPLogSeverity threshold, std::vector<TPlugIn> const& plugIns) {
   constexpr char const* kName = "log threshold";
-  if (threshold < ILogger::kLogDebug) return Works(kName, "debug entries are dropped");
+  std::vector<std::string> files;  // of the plug-ins that lower it
+  for (TPlugIn const& plugIn : plugIns)
+    if (plugIn.fLogsDebug) files.push_back(plugIn.fFile);
+  if (files.empty() && threshold < ILogger::kLogDebug) return Works(kName, "debug entries are dropped");
   return Fails(kName, "debug entries are logged: the log contains the passwords of controllers' sessions",
-               "set the threshold to status (TLogger::SetLogThreshold), or look for the plug-in that changes it");
+               "set the threshold to status (TLogger::SetLogThreshold)" + (files.empty() ? "" : " in " + Joined(files, ", ")));
 }
+
+namespace {
+
+std::string RemedyFor(TPlugIn const& plugIn) {
+  std::string const& file = plugIn.fFile;
+  switch (plugIn.fRule) {
+    case EPlugInRule::kMissing:
+      return "correct the path after --plugin, or remove the broken link";
+    case EPlugInRule::kKind:
+      return "replace " + file + " with a regular file, or remove it";
+    case EPlugInRule::kPermission:
+      return "let this user read " + file;
+    case EPlugInRule::kWritable:
+      return "let only root write " + file + " and the directories above it, or pass --allow-writable";
+    case EPlugInRule::kReplaced:
+      return "name one plug-in of a name with --plugin";
+    case EPlugInRule::kName:
+      return "rename " + file + " to lib<NAME>.nsp.so, or remove it";
+    default:
+      return "mend " + file + ", or remove it";
+  }
+}
+
+}  // namespace
 
 std::vector<TCheck> CheckPlugIns(std::vector<TPlugIn> const& plugIns, std::string const& directory) {
   std::vector<TCheck> checks;
   for (TPlugIn const& plugIn : plugIns) {
     std::string const name = "plug-in " + plugIn.fName;
     std::vector<std::string> failures = FailuresOf({plugIn});
-    if (failures.empty() && plugIn.fProviders.empty()) failures.push_back("it registers no provider");
-    checks.push_back(failures.empty() ? Works(name, plugIn.fFile)
-                                      : Fails(name, Joined(failures, "; "), "mend " + plugIn.fFile + ", or remove it"));
+    if (failures.empty() && plugIn.fProviders.empty()) failures.emplace_back("it registers no provider");
+    checks.push_back(failures.empty() ? Works(name, plugIn.fFile) : Fails(name, Joined(failures, "; "), RemedyFor(plugIn)));
   }
   if (checks.empty())
     checks.push_back(

@@ -41,8 +41,9 @@ TCheck CheckProgram(std::string const& program, std::string const& path, std::st
 // Whether the logger can write files there. The directory need not exist: the logger creates it with its parents.
 TCheck CheckLogDirectory(std::string const& directory);
 
-// At debug severity the library logs the passwords of controllers' sessions.
-TCheck CheckLogThreshold(ILogger::EZEPLogSeverity threshold);
+// At debug severity the library logs the passwords of controllers' sessions. `threshold`: of this process, which the plug-ins
+// have changed only if they were loaded into it.
+TCheck CheckLogThreshold(ILogger::EZEPLogSeverity threshold, std::vector<TPlugIn> const& plugIns);
 
 // One check for each plug-in, or one that there are none.
 std::vector<TCheck> CheckPlugIns(std::vector<TPlugIn> const& plugIns, std::string const& directory);

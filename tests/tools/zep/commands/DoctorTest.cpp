@@ -87,11 +87,21 @@ TEST_F(DoctorTest, APlugInThatRegistersNothingDoesNotWork) {
   EXPECT_EQ(Check("plug-in RegistersNothing")["finding"], "it registers no provider");
 }
 
+TEST_F(DoctorTest, ATriedPlugInThatIsMissingHasItsRemedy) {
+  nlohmann::json const check = Check("plug-in Gone", {"--plugin", "/nowhere/libGone.nsp.so"});
+  EXPECT_THAT(check["finding"], HasSubstr("No such file or directory"));
+  EXPECT_EQ(check["remedy"], "correct the path after --plugin, or remove the broken link");
+}
+
 TEST_F(DoctorTest, APlugInThatTurnsTheDebugLogOnIsNoticed) {
   fZep.Add("libTest.nsp.so", TEST_PROVIDER);
   EXPECT_EQ(Check("log threshold")["works"], true);
   fCall.fEnvironment["ZEP_TEST_PROVIDER"] = "logs-debug";
-  EXPECT_EQ(Check("log threshold", {"--in-process"})["works"], false);
+  for (std::vector<std::string> const& options : {std::vector<std::string>{}, {"--in-process"}}) {
+    EXPECT_EQ(Check("log threshold", options)["works"], false);
+    EXPECT_EQ(Check("log threshold", options)["remedy"],
+              "set the threshold to status (TLogger::SetLogThreshold) in " + fZep.Path("lib/libTest.nsp.so"));
+  }
 }
 
 TEST_F(DoctorTest, TheTextHasARowForEachCheckWithItsRemedy) {

@@ -100,11 +100,16 @@ TEST(ChecksTest, ALogDirectoryCanBeWrittenOrCreated) {
 }
 
 TEST(ChecksTest, ADebugLogContainsPasswords) {
-  EXPECT_EQ(TextOf(CheckLogThreshold(ILogger::kLogStatus)), "works: debug entries are dropped");
+  std::string const fails =
+      "debug entries are logged: the log contains the passwords of controllers' sessions -> set the threshold to status "
+      "(TLogger::SetLogThreshold)";
+  TPlugIn const quiet{"Quiet", "/p/libQuiet.nsp.so", 1, "", {}};
+  TPlugIn verbose{"Verbose", "/p/libVerbose.nsp.so", 1, "", {}};
+  verbose.fLogsDebug = true;
+  EXPECT_EQ(TextOf(CheckLogThreshold(ILogger::kLogStatus, {quiet})), "works: debug entries are dropped");
   for (auto const severity : {ILogger::kLogDebug, ILogger::kLogVerbose})
-    EXPECT_EQ(TextOf(CheckLogThreshold(severity)),
-              "debug entries are logged: the log contains the passwords of controllers' sessions -> set the threshold to status "
-              "(TLogger::SetLogThreshold), or look for the plug-in that changes it");
+    EXPECT_EQ(TextOf(CheckLogThreshold(severity, {quiet})), fails);
+  EXPECT_EQ(TextOf(CheckLogThreshold(ILogger::kLogStatus, {quiet, verbose})), fails + " in /p/libVerbose.nsp.so");
 }
 
 TEST(ChecksTest, EachPlugInHasACheck) {
@@ -123,6 +128,21 @@ TEST(ChecksTest, EachPlugInHasACheck) {
   std::vector<TCheck> const none = CheckPlugIns({}, "/p");
   ASSERT_EQ(none.size(), 1u);
   EXPECT_EQ(TextOf(none[0]), "there is no plug-in in /p -> install the package libzepcore, or copy plug-ins there");
+}
+
+TEST(ChecksTest, TheRemedyForAFileThatIsPassedOverIsThatOfTheRule) {
+  TPlugIn plugIn{"Gone", "/p/libGone.nsp.so", 0, "why", {}};
+  std::map<EPlugInRule, std::string> const remedies = {
+      {EPlugInRule::kMissing, "correct the path after --plugin, or remove the broken link"},
+      {EPlugInRule::kKind, "replace /p/libGone.nsp.so with a regular file, or remove it"},
+      {EPlugInRule::kPermission, "let this user read /p/libGone.nsp.so"},
+      {EPlugInRule::kWritable, "let only root write /p/libGone.nsp.so and the directories above it, or pass --allow-writable"},
+      {EPlugInRule::kReplaced, "name one plug-in of a name with --plugin"},
+      {EPlugInRule::kName, "rename /p/libGone.nsp.so to lib<NAME>.nsp.so, or remove it"}};
+  for (auto const& [rule, remedy] : remedies) {
+    plugIn.fRule = rule;
+    EXPECT_EQ(CheckPlugIns({plugIn}, "/p").front().fRemedy, remedy);
+  }
 }
 
 TEST(ChecksTest, TheStatusIsCompleteOnlyWhenEverythingWorks) {
