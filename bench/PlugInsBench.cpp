@@ -1,13 +1,20 @@
 // SPDX-License-Identifier: Apache-2.0
 
 // Compares plug-ins in processes of their own with plug-ins in the process of the front end: the host provider with the bundled
-// sample, and a provider of 100,000 instances. Each load runs in a fresh process, which measures itself.
+// sample, and a provider of 100,000 instances. Each load runs in a fresh process, which measures itself. Report is a whole run of
+// zep report with the host provider, from the start of the program to its end.
 
 #include <benchmark/benchmark.h>
+#include <fcntl.h>
+#include <spawn.h>
 #include <stdio.h>
+#include <stdlib.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <array>
+#include <chrono>
 #include <string>
 
 namespace {
@@ -44,6 +51,33 @@ void Time(benchmark::State& state, char const* directory, char const* way, std::
   }
 }
 
+// The seconds of a run of zep report; negative when it fails. `option` may be null.
+double SecondsOfReport(char const* option) {
+  ::setenv("LD_LIBRARY_PATH", ZEP_HOST_PLUG_IN, 1);
+  std::array<char const*, 5> const arguments = {ZEP_PROGRAM, "report", "--sample", option, nullptr};
+  posix_spawn_file_actions_t actions;
+  ::posix_spawn_file_actions_init(&actions);
+  ::posix_spawn_file_actions_addopen(&actions, STDOUT_FILENO, "/dev/null", O_WRONLY, 0);
+  auto const start = std::chrono::steady_clock::now();
+  pid_t program = -1;
+  int const error = ::posix_spawn(&program, ZEP_PROGRAM, &actions, nullptr, const_cast<char**>(arguments.data()), environ);
+  int status = 0;
+  bool const hasRun = error == 0 && ::waitpid(program, &status, 0) == program && status == 0;
+  double const seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+  ::posix_spawn_file_actions_destroy(&actions);
+  return hasRun ? seconds : -1;
+}
+
+void TimeOfReport(benchmark::State& state, char const* option) {
+  for (auto _ : state) {
+    std::array<double, 11> seconds;
+    std::generate(seconds.begin(), seconds.end(), [option] { return SecondsOfReport(option); });
+    std::sort(seconds.begin(), seconds.end());
+    if (seconds.front() < 0) return state.SkipWithError("zep report fails");
+    state.SetIterationTime(seconds[seconds.size() / 2]);
+  }
+}
+
 // Reports a mebibyte as a millisecond.
 void Memory(benchmark::State& state, char const* way) {
   for (auto _ : state) {
@@ -58,6 +92,12 @@ BENCHMARK(Host_Apart)->UseManualTime()->Iterations(3)->Unit(benchmark::kMicrosec
 
 void Host_InProcess(benchmark::State& state) { Time(state, ZEP_HOST_PLUG_IN, "here", 11); }
 BENCHMARK(Host_InProcess)->UseManualTime()->Iterations(3)->Unit(benchmark::kMicrosecond);
+
+void Report_Apart(benchmark::State& state) { TimeOfReport(state, nullptr); }
+BENCHMARK(Report_Apart)->UseManualTime()->Iterations(3)->Unit(benchmark::kMicrosecond);
+
+void Report_InProcess(benchmark::State& state) { TimeOfReport(state, "--in-process"); }
+BENCHMARK(Report_InProcess)->UseManualTime()->Iterations(3)->Unit(benchmark::kMicrosecond);
 
 void Thirty_Milliseconds(benchmark::State& state) {
   for (auto _ : state) state.SetIterationTime(0.030);

@@ -5,6 +5,7 @@
 #include "collect/answer/AnswerLimits.h"
 
 #include <algorithm>
+#include <optional>
 #include <regex>
 #include <sstream>
 
@@ -16,23 +17,30 @@ constexpr char const* kLabels[] = {"Error", "Warning", "Status", "Debug", "Verbo
 
 constexpr std::size_t kEnd = 64 * 1024;  // searched for the last entry
 
+// The entry that the line begins; none if it continues one. Most logs have no entry, so that nobody waits for the expression,
+// which takes longer to compile than many lines to read.
+std::optional<TLogLine> EntryIn(std::string const& line) {
+  if (line.rfind("FDR_[", 0) != 0) return std::nullopt;
+  static std::regex const entry(R"(FDR_\[(Error|Warning|Status|Debug|Verbose)\] \d+/\d+/\d+  \d+:\d+:\d+ )");
+  std::string const head = line.substr(0, 48);  // longer than the head of any entry
+  std::smatch match;
+  if (!std::regex_search(head, match, entry, std::regex_constants::match_continuous)) return std::nullopt;
+  int severity = 0;
+  while (kLabels[severity] != match[1]) ++severity;
+  return TLogLine{static_cast<ILogger::EZEPLogSeverity>(severity), line.substr(static_cast<std::size_t>(match.length()))};
+}
+
 }  // namespace
 
 std::vector<TLogLine> LogLinesOf(std::string const& text) {
-  static std::regex const entry(R"(FDR_\[(Error|Warning|Status|Debug|Verbose)\] \d+/\d+/\d+  \d+:\d+:\d+ )");
   std::vector<TLogLine> lines;
   std::istringstream stream(text);
-  std::smatch match;
   for (std::string line; std::getline(stream, line);) {
     if (line.rfind("-- ZEP Log ", 0) == 0) continue;
-    std::string const head = line.substr(0, 48);  // longer than the head of any entry
-    if (std::regex_search(head, match, entry, std::regex_constants::match_continuous)) {
-      int severity = 0;
-      while (kLabels[severity] != match[1]) ++severity;
-      lines.push_back({static_cast<ILogger::EZEPLogSeverity>(severity), line.substr(static_cast<std::size_t>(match.length()))});
-    } else if (!lines.empty()) {
+    if (auto const entry = EntryIn(line))
+      lines.push_back(*entry);
+    else if (!lines.empty())
       lines.back().fMessage += "\n" + line;
-    }
   }
   return lines;
 }

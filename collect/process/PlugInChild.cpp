@@ -124,7 +124,11 @@ void WriteNoCoreDump() {
 }
 
 // When memory is short, the system ends this process rather than the owner.
-void BeTheFirstWithoutMemory() { std::ofstream("/proc/self/oom_score_adj") << 500; }
+void BeTheFirstWithoutMemory() {
+  TUniqueFd const score(::open("/proc/self/oom_score_adj", O_WRONLY | O_CLOEXEC));
+  if (score) [[maybe_unused]]
+    ssize_t const written = ::write(score.get(), "500", 3);
+}
 
 void LimitMemory(std::uint64_t bytes) {
   if (bytes == 0) return;

@@ -45,7 +45,7 @@ TUniqueFd BlockAndWatchChildren() {
 
 class TSupervised {
 public:
-  explicit TSupervised(pid_t child) : fChild(child), fVerdict{0, false, 0} {}
+  TSupervised(pid_t child, int failure) : fChild(child), fVerdict{0, false, failure} {}
 
   // Reaps the child, and orphans that became children. True when the child has ended.
   bool HasEnded() {
@@ -90,6 +90,16 @@ private:
   TVerdict fVerdict;
 };
 
+// Until the child has ended or the owner has closed the control pipe.
+void WaitForEnd(TSupervised& supervised, int signals, int control) {
+  pollfd polled[] = {{control, POLLIN, 0}, {signals, POLLIN, 0}};
+  while (!supervised.HasEnded() && polled[0].revents == 0) {
+    ::poll(polled, 2, -1);
+    signalfd_siginfo ignored;
+    while (::read(signals, &ignored, sizeof ignored) > 0) continue;
+  }
+}
+
 void Send(int fd, TVerdict const& verdict) { [[maybe_unused]] ssize_t const sent = ::write(fd, &verdict, sizeof verdict); }
 
 [[noreturn]] void GiveUp(int fd) {
@@ -101,27 +111,18 @@ void Send(int fd, TVerdict const& verdict) { [[maybe_unused]] ssize_t const sent
 
 void Supervise(TSupervisorEnds const& ends, std::function<void()> const& work) noexcept {
   ::setsid();
-  ResetSignals();
   ::prctl(PR_SET_CHILD_SUBREAPER, 1);
-  std::vector<int> kept = ends.fOfWork;
-  kept.insert(kept.end(), {ends.fControl, ends.fVerdict});
-  CloseAllBut(kept);
-  TUniqueFd const ended = BlockAndWatchChildren();
-  if (!ended) GiveUp(ends.fVerdict);
   pid_t const supervisor = ::getpid();
-  pid_t const child = ::fork();
+  pid_t const child = ::fork();  // before all that the plug-in need not wait for
   if (child == 0) BeChild(supervisor, work);
   if (child < 0) GiveUp(ends.fVerdict);
 
+  ResetSignals();
+  CloseAllBut({ends.fControl, ends.fVerdict});
   for (int const fd : {0, 1, 2}) MakeNull(fd);
-  CloseAllBut({ends.fControl, ends.fVerdict, ended.get()});
-  TSupervised supervised(child);
-  pollfd polled[] = {{ends.fControl, POLLIN, 0}, {ended.get(), POLLIN, 0}};
-  while (!supervised.HasEnded() && polled[0].revents == 0) {
-    ::poll(polled, 2, -1);
-    signalfd_siginfo ignored;
-    while (::read(ended.get(), &ignored, sizeof ignored) > 0) continue;
-  }
+  TUniqueFd const ended = BlockAndWatchChildren();
+  TSupervised supervised(child, ended ? 0 : errno);
+  if (ended) WaitForEnd(supervised, ended.get(), ends.fControl);
   supervised.EndAll();
   Send(ends.fVerdict, supervised.Verdict());
   ::_exit(0);

@@ -2,7 +2,6 @@
 #pragma once
 
 #include <functional>
-#include <vector>
 
 namespace NQRVZEP20 {
 
@@ -15,9 +14,8 @@ struct TVerdict {
 
 // The descriptors of a supervisor. It closes all others.
 struct TSupervisorEnds {
-  int fControl;              // the read end of a pipe that the owner keeps open as long as the plug-in may run
-  int fVerdict;              // the write end of a pipe to which a TVerdict is written
-  std::vector<int> fOfWork;  // that remain open for `work`
+  int fControl;  // the read end of a pipe that the owner keeps open as long as the plug-in may run
+  int fVerdict;  // the write end of a pipe to which a TVerdict is written
 };
 
 // The main function of a supervisor, the process between the owner and a plug-in. Runs `work` in a child, waits until the child
@@ -26,8 +24,8 @@ struct TSupervisorEnds {
 // supervisor.
 //
 // Supervisor and child each have a session of their own, so a Ctrl-C on the terminal reaches neither. In the child, all signals
-// have their default disposition and none is blocked; `work` must close the descriptors that it does not need. An exception ends
-// the process that throws it.
+// have their default disposition and none is blocked; `work` inherits all descriptors of the owner, and must close those that it
+// does not need. An exception ends the process that throws it.
 [[noreturn]] void Supervise(TSupervisorEnds const& ends, std::function<void()> const& work) noexcept;
 
 }  // namespace NQRVZEP20

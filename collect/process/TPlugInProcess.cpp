@@ -85,7 +85,7 @@ void TPlugInProcess::Start(TApartLimits const& limits, bool measures) {
                           log.fWriteEnd.get(),
                           limits.fMemoryMebibytes * 1024 * 1024,
                           measures};
-  TSupervisorEnds const ends{control.fReadEnd.get(), verdict.fWriteEnd.get(), {setup.fAnswer, setup.fWords, setup.fLog}};
+  TSupervisorEnds const ends{control.fReadEnd.get(), verdict.fWriteEnd.get()};
   std::function<void()> const work = [&] { RunPlugIn(setup); };
   fSupervisor = ForkOrThrow();
   if (fSupervisor == 0) {
