@@ -268,12 +268,13 @@ TReportRow const* TReport::FindRow(std::string const& key) const {
   return row != nullptr ? row : FindIn(fDetails, key);
 }
 
-TReport MakeReport(std::vector<TPlugIn> plugIns, std::optional<TSample> sample) {
+TReport MakeReport(std::vector<TPlugIn> plugIns, std::optional<TSample> sample, TReportRules const& rules) {
   TReport report{};
   report.fPlugIns = std::move(plugIns);
   report.fSample = std::move(sample);
   report.fTableFile = report.fSample ? "" : NamedTableFile();
   TViews const views = ViewsOf(report.fPlugIns);
+  report.fFindings = MakeFindings(views, rules.fThresholds, rules.fRules);
   for (TQuestion const& question : kIdentity) {
     auto const query = [&](TNamespaceView const& view) { return question.fAnswer(question, view); };
     report.fIdentity.push_back({question.fKey, question.fLabel, BestAnswer(views, report.fPlugIns, query)});

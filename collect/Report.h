@@ -5,6 +5,7 @@
 #include "collect/PlugIns.h"
 #include "collect/Sample.h"
 #include "collect/TAnswer.h"
+#include "collect/findings/Findings.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -49,6 +50,7 @@ struct TReportRow {
 // A report owns its rows; the views in fPlugIns share ownership of the namespaces. Several threads may read the rows; read the
 // views from one thread at a time (TNamespaceView.h).
 struct TReport {
+  TFindings fFindings;  // these do not affect the completeness
   std::vector<TReportRow> fIdentity;
   std::vector<TReportRow> fDetails;  // these do not affect the completeness
   std::vector<TPlugIn> fPlugIns;
@@ -60,10 +62,16 @@ struct TReport {
   TReportRow const* FindRow(std::string const& key) const;
 };
 
+// The rules of a report. A front end may add its own to the standard ones.
+struct TReportRules {
+  TThresholds fThresholds = {};
+  std::vector<TRule> fRules = StandardRules();
+};
+
 // Makes the report from the namespaces of the plug-ins. `sample` is the one that was passed to LoadPlugIns or LoadPlugInsApart,
 // if any. Each value is taken from the first provider that has it. If a provider throws, the value is unknown, with the code
 // provider-failed; its exceptions do not pass through. Without plug-ins every row is unknown. Blocks while it reads the
 // namespaces.
-TReport MakeReport(std::vector<TPlugIn> plugIns, std::optional<TSample> sample = std::nullopt);
+TReport MakeReport(std::vector<TPlugIn> plugIns, std::optional<TSample> sample = std::nullopt, TReportRules const& rules = {});
 
 }  // namespace NQRVZEP20

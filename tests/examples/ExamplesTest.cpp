@@ -124,6 +124,19 @@ TEST(PrintReportTest, PrintsTheIdentityAndTheMemoryOfTheSample) {
   EXPECT_THAT(PrintedReport(), testing::MatchesRegex("Host name: db1\n(.*\n)*OS: (.*\n)*Memory: 128 GiB\n0\n"));
 }
 
+// The answer of the example's rule about a machine with that SMBIOS table.
+std::string AnswerOfOwnRule(std::string const& table) {
+  TEnvironmentGuard const variable("ZEP_SMBIOS_TABLE", table.c_str());
+  return OutputOf(ZEP_OWN_RULE);
+}
+
+TEST(OwnRuleTest, FindsTheProblemOrNothingOrTheReason) {
+  TTempDir const dir;
+  EXPECT_EQ(AnswerOfOwnRule(SourcePath("tools/zep/sample/smbios.bin")), "site-memory: fine\n");
+  WriteFile(dir.Path("empty"), "");
+  EXPECT_EQ(AnswerOfOwnRule(dir.Path("empty")), "site-memory: not-asked\n");
+}
+
 TEST(ListProviderTest, EndsInTheStatusOfAPlugInThatDoesNotLoad) {
   EXPECT_EQ(OutputOf(ZEP_LIST_PROVIDER " /nowhere/libNone.nsp.so 2>&1; echo $?"), "kZEPStatusFileSystemError\n1\n");
 }
@@ -168,6 +181,7 @@ TShown const kShown[] = {{"README.md", "ReadmeExample.cpp", "ReadmeExample.cpp"}
                          {"docs/writing-a-provider.md", "Batteries/Batteries.cpp", "Batteries/Batteries.cpp"},
                          {"docs/writing-a-provider.md", "Batteries/CMakeLists.txt", "Batteries/CMakeLists.txt"},
                          {"docs/writing-a-front-end.md", "PrintReport.cpp", "PrintReport.cpp"},
+                         {"docs/findings.md", "OwnRule.cpp", "OwnRule.cpp"},
                          {"docs/schemas.md", "Disks/Disks.cpp", "Disks/Disks.cpp"},
                          {"docs/schemas.md", "Disks/disks.mof", "Disks/disks.mof"},
                          {"docs/schemas.md", "Disks/CMakeLists.txt", "Disks/CMakeLists.txt"}};

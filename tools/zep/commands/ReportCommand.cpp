@@ -2,10 +2,13 @@
 
 // zep report: which machine this is.
 
+#include "TConfig.h"
+#include "TOSSpecific.h"
 #include "collect/Report.h"
 #include "tools/zep/commands/Commands.h"
 #include "tools/zep/commands/Providers.h"
 #include "tools/zep/media/TMountedMedium.h"
+#include "tools/zep/output/FindingsText.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/ReportJson.h"
@@ -18,6 +21,7 @@
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
 #include <iostream>
 #include <memory>
 #include <optional>
@@ -36,8 +40,31 @@ struct TArguments {
   TTransferOptions fOptions;
   TPlugInArguments fPlugIns;
   TReportParts fParts;
+  std::string fFailOn;  // a severity; empty for none
   std::string fMedium;  // the device to write to; empty for standard output
 };
+
+// The settings of the working directory. The library logs a missing or empty file as an error, so it is not read then.
+std::string SettingOf(std::string const& key) {
+  constexpr char const* file = "zep.cfg";
+  if (!TOSSpecific::FileExists(file) || TOSSpecific::GetFileSize(file) == 0) return "";
+  auto const keys = TConfig::GetInstance()->listKeys();
+  return std::find(keys.begin(), keys.end(), key) != keys.end() ? TConfig::GetInstance()->getValue(key) : "";
+}
+
+TReportRules RulesWithSettings() {
+  try {
+    return {TThresholds::From(SettingOf)};
+  } catch (std::invalid_argument const& failure) {
+    throw TWrongUsage(std::string(failure.what()) + " (zep.cfg)");
+  }
+}
+
+// Whether the findings make the command fail.
+bool FailsBecauseOfFindings(TReport const& report, TArguments const& arguments) {
+  auto const worst = report.fFindings.Worst();
+  return !arguments.fFailOn.empty() && worst && *worst >= *SeverityFrom(arguments.fFailOn);
+}
 
 // Returns the mount points at which the medium is still mounted. When writing fails or is interrupted, the medium is unmounted as
 // well, and the exception of the writing is passed on.
@@ -111,6 +138,11 @@ int Deliver(TReport const& report, TTarget const& target, TArguments const& argu
     if (sent.fTransferred.fOutcome.fExit != kExitComplete) status = sent.fTransferred.fOutcome.fExit;
     AddSending(document, sent);
   }
+  if (FailsBecauseOfFindings(report, arguments) && (status == kExitComplete || status == kExitPartial)) {
+    status = kExitFindings;
+    document["exitStatus"] = static_cast<int>(status);
+    document["reason"] = CountsOf(report.fFindings);
+  }
   if (arguments.fAsJson) WriteOutput(AsText(document));
   return status;
 }
@@ -123,7 +155,8 @@ int Report(TArguments const& arguments) {
     TTarget const target = arguments.fTarget.empty() ? TTarget{} : TargetOf(arguments.fTarget, arguments.fBySftp);
     if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
     sample = SampleIf(arguments.fSample);
-    return Deliver(MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample), target, arguments, guard);
+    TReportRules const rules = RulesWithSettings();
+    return Deliver(MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample, rules), target, arguments, guard);
   } catch (std::exception const& failure) {
     bool const isOfMedium = !arguments.fMedium.empty() && arguments.fAsJson && !HasWrittenOutput();
     if (isOfMedium) WriteOutput(FailureAsJson(kToMedia, StatusOf(failure), failure.what(), sample ? sample->fLabel : ""));
@@ -138,10 +171,8 @@ int Report(TArguments const& arguments) {
 TRun AddReportArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   auto* const json = command.add_flag("--json", arguments->fAsJson, "Print one JSON document, with every instance");
-  command
-      .add_option("--section", arguments->fParts.fSections,
-                  "Print only this section (repeatable): " + Joined(SectionNames(), ", "))
-      ->check(CLI::IsMember(SectionNames()).description(""))
+  command.add_option("--section", arguments->fParts.fSections, "Print only this section (repeatable)")
+      ->check(CLI::IsMember(SectionNames()).description(Joined(SectionNames(), ", ")))
       ->type_name("NAME")
       ->excludes(json);
   command.add_flag("--full", arguments->fParts.fAllInstances, "Also print every instance with all its properties")
@@ -154,12 +185,17 @@ TRun AddReportArguments(CLI::App& command) {
                      "Also send the JSON document, compressed: ftp://[USER@]HOST[:PORT]/DIRECTORY/, sftp://..., or\n"
                      "[USER@]HOST[:PORT] alone. A report that cannot be sent is kept in a file, whose path is printed");
   command.add_flag("--sftp", arguments->fBySftp, "Use SFTP instead of FTP for a target without ftp:// or sftp://");
+  command.add_option("--fail-on", arguments->fFailOn, "Exit with status 3 if a finding has this severity or a worse one")
+      ->check(
+          CLI::IsMember({"information", "warning", "error", "critical"}).description("information, warning, error or critical"))
+      ->type_name("SEVERITY");
   AddUploadOptions(command, arguments->fOptions);
   AddPlugInOptions(command, arguments->fPlugIns);
   command.footer(
       "Exit status: 0 when the identity is complete, even if details are missing, 2 when part of the identity is missing or\n"
-      "a plug-in failed, 1 when none of it is known or the medium could not be mounted, written or unmounted, 64 for wrong\n"
-      "usage; when the report could not be sent, the exit status of zep send.");
+      "a plug-in failed, 3 when a finding is as severe as --fail-on says or worse, 1 when none of it is known or the medium\n"
+      "could not be mounted, written or unmounted, 64 for wrong usage; when the report could not be sent, the exit status\n"
+      "of zep send.");
   return [arguments] { return Report(*arguments); };
 }
 

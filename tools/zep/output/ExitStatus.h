@@ -10,6 +10,7 @@ enum EExitStatus {
   kExitComplete = 0,  // everything was done
   kExitNothing = 1,   // nothing was done
   kExitPartial = 2,   // part of it was done; the output states what is missing, and why
+  kExitFindings = 3,  // everything was done, but zep report found a problem of the severity given by --fail-on, or a worse one
   kExitUsage = 64,    // wrong usage
 
   // Only for transfers, which end with kExitNothing if the server refuses them or they fail halfway:

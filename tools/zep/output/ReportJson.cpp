@@ -3,6 +3,7 @@
 
 #include "ICIMInstance.h"
 #include "collect/FailureOf.h"
+#include "tools/zep/output/FindingsJson.h"
 #include "tools/zep/output/PlugInRows.h"
 #include "tools/zep/output/ReportPhrases.h"
 
@@ -50,6 +51,7 @@ TJson ReportAsJson(TReport const& report) {
   document["status"] = NameOf(status);
   document["head"] = HeadLines(report);
   document["smbiosTableFile"] = OrNull(report.fTableFile);
+  document["findings"] = FindingsAsJson(report.fFindings);
   document["identity"] = RowsAsJson(report.fIdentity);
   document["details"] = RowsAsJson(report.fDetails);
   document["plugInDirectory"] = PlugInDirectory();

@@ -5,6 +5,7 @@
 #include "ICIMInstance.h"
 #include "MissingValueClass.h"
 #include "collect/FailureOf.h"
+#include "tools/zep/output/FindingsText.h"
 #include "tools/zep/output/InstanceText.h"
 #include "tools/zep/output/PlugInRows.h"
 #include "tools/zep/output/ReportPhrases.h"
@@ -18,6 +19,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
+constexpr char const* kFindings = "findings";
 constexpr char const* kIdentity = "identity";
 constexpr char const* kDetails = "details";
 constexpr char const* kPlugIns = "plug-ins";
@@ -45,9 +47,11 @@ std::string PlugInsAsText(std::string const& title, std::vector<TPlugIn> const& 
   return table.GetText();
 }
 
-bool IsWanted(TReportParts const& parts, std::string const& name) {
-  return parts.fSections.empty() || std::find(parts.fSections.begin(), parts.fSections.end(), name) != parts.fSections.end();
+bool IsNamed(TReportParts const& parts, std::string const& name) {
+  return std::find(parts.fSections.begin(), parts.fSections.end(), name) != parts.fSections.end();
 }
+
+bool IsWanted(TReportParts const& parts, std::string const& name) { return parts.fSections.empty() || IsNamed(parts, name); }
 
 bool HasUnknown(TReportSection const& section) {
   for (auto const& row : section.fRows)
@@ -91,7 +95,7 @@ std::string InstancesAsText(TReport const& report) {
 
 std::vector<std::string> SectionNames() {
   std::vector<std::string> names = SectionKeys();
-  names.insert(names.begin(), {kIdentity, kDetails});
+  names.insert(names.begin(), {kFindings, kIdentity, kDetails});
   names.emplace_back(kPlugIns);
   return names;
 }
@@ -102,6 +106,8 @@ std::string ReportAsText(TReport const& report, TReportParts const& parts) {
   for (std::string const& line : HeadLines(report)) text += Printable(line) + "\n";
   if (!report.fTableFile.empty())
     text += Printable("SMBIOS tables read from the file " + report.fTableFile + " (ZEP_SMBIOS_TABLE)") + "\n";
+  if (IsWanted(parts, kFindings)) text += "\n" + FindingsAsText(report.fFindings, label);
+  if (IsNamed(parts, kFindings)) text += "\n" + RulesAsText(report.fFindings, label);
   if (IsWanted(parts, kIdentity)) text += "\n" + RowsAsText(label + "Identity", report.fIdentity);
   if (IsWanted(parts, kDetails)) text += "\n" + RowsAsText(label + "Details", report.fDetails);
   text += SectionsAsText(report, parts);

@@ -1,0 +1,86 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/findings/Rules.h"
+
+#include <algorithm>
+#include <cstdio>
+#include <map>
+#include <optional>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+// The end of a link at a PCI function.
+struct TLinkEnd {
+  std::optional<std::uint64_t> fWidth, fMaxWidth;  // in lanes
+  std::optional<double> fRate, fMaxRate;           // in gigatransfers per second
+};
+
+TLinkEnd LinkEndOf(TElement const& link) {
+  return {link.Number("Width").fValue, link.Number("MaxWidth").fValue, link.Real("TransferRate").fValue,
+          link.Real("MaxTransferRate").fValue};
+}
+
+std::string RateText(double rate) {
+  char text[32];
+  std::snprintf(text, sizeof text, "%g GT/s", rate);
+  return text;
+}
+
+// The addresses of the functions below bridges, each with the address of its bridge.
+std::map<std::string, std::string> BridgesOf(TRuleRun const& run) {
+  std::map<std::string, std::string> bridges;
+  for (TElement const& control : run.TryElements("CIM_ControlledBy")) {
+    auto const bridge = control.KeyOf("Antecedent", "DeviceID"), function = control.KeyOf("Dependent", "DeviceID");
+    if (bridge.IsKnown() && function.IsKnown()) bridges[*function.fValue] = *bridge.fValue;
+  }
+  return bridges;
+}
+
+// Display controllers lower the rate of their link while they are idle.
+std::map<std::string, bool> DisplayControllers(TRuleRun const& run) {
+  constexpr std::uint64_t display = 3;
+  std::map<std::string, bool> isDisplay;
+  for (TElement const& device : run.TryElements("CIM_PCIDevice")) {
+    auto const code = device.Number("ClassCode");
+    isDisplay[*device.Text("DeviceID").fValue] = code.IsKnown() && *code.fValue == display;
+  }
+  return isDisplay;
+}
+
+void AskPciLink(TRuleRun& run) {
+  auto const links = run.Elements("ZEP_PCIExpressLink");
+  auto const bridges = BridgesOf(run);
+  auto isDisplay = DisplayControllers(run);
+  std::map<std::string, TLinkEnd> ends;
+  for (TElement const& link : links) ends[*link.Text("DeviceID").fValue] = LinkEndOf(link);
+
+  for (TElement const& link : links) {
+    std::string const address = *link.Text("DeviceID").fValue;
+    auto const bridge = bridges.find(address);
+    if (bridge == bridges.end() || ends.count(bridge->second) == 0) continue;  // an end of no link, or its upper end
+    TLinkEnd const &lower = ends[address], &upper = ends[bridge->second];
+    if (!lower.fWidth || *lower.fWidth == 0 || !lower.fMaxWidth || !upper.fMaxWidth) continue;
+    run.Know(link, link.Number("Width"));
+    std::string const name = "the PCI Express link of " + address;
+    std::uint64_t const lanes = std::min(*lower.fMaxWidth, *upper.fMaxWidth);
+    if (*lower.fWidth < lanes)
+      run.Add(link, link.Number("Width").fSource, ESeverity::kWarning,
+              name + " has " + std::to_string(*lower.fWidth) + " of the " + std::to_string(lanes) + " lanes that both ends have",
+              "Seat the card anew; check the riser and the settings of the slot in the firmware.");
+    if (!lower.fRate || !lower.fMaxRate || !upper.fMaxRate || isDisplay[address]) continue;
+    double const rate = std::min(*lower.fMaxRate, *upper.fMaxRate);
+    if (*lower.fRate < rate)
+      run.Add(link, link.Real("TransferRate").fSource, ESeverity::kWarning,
+              name + " runs at " + RateText(*lower.fRate) + ", although both ends can run at " + RateText(rate),
+              "Seat the card anew; check the riser and the settings of the slot in the firmware.");
+  }
+}
+
+}  // namespace
+
+std::vector<TRule> DeviceRules() {
+  return {{"pci-link", "Is a PCI Express link narrower or slower than both ends allow?", AskPciLink}};
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,128 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/findings/Rules.h"
+
+#include <set>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+constexpr char const* kCheckCable = "Check the cable, the transceivers and the port of the switch.";
+
+bool Has(std::vector<std::string> const& codes, std::string const& code) {
+  for (std::string const& each : codes)
+    if (each == code) return true;
+  return false;
+}
+
+bool IsUp(TElement const& port) {
+  auto const status = port.Texts("OperationalStatus");
+  return status.IsKnown() && Has(*status.fValue, "2");
+}
+
+bool IsEnabled(TElement const& port) {
+  auto const state = port.Text("EnabledState");
+  return state.IsKnown() && *state.fValue == "2";
+}
+
+std::uint64_t SumOf(TElement const& statistics, std::initializer_list<char const*> properties) {
+  std::uint64_t sum = 0;
+  for (char const* property : properties) {
+    auto const count = statistics.Number(property);
+    sum += count.IsKnown() ? *count.fValue : 0;
+  }
+  return sum;
+}
+
+void AskPortErrors(TRuleRun& run) {
+  constexpr std::uint64_t million = 1000000, fewest = 10;  // a handful of errors happens when a cable is plugged in
+  for (TElement const& statistics : run.Elements("ZEP_InterfaceStatistics")) {
+    if (!run.Know(statistics, statistics.Number("ReceiveErrors"))) continue;
+    std::uint64_t const errors = SumOf(statistics, {"ReceiveErrors", "TransmitErrors"});
+    std::uint64_t const packets = SumOf(statistics, {"PacketsReceived", "PacketsTransmitted"}) + errors;
+    if (errors < fewest || errors * million / packets < run.Thresholds().fPortErrorsPerMillion) continue;
+    run.Add(statistics, statistics.Number("ReceiveErrors").fSource, ESeverity::kWarning,
+            "the network interface " + statistics.Label() + " has " + std::to_string(errors) + " errors in " +
+                std::to_string(packets) + " packets",
+            kCheckCable);
+  }
+}
+
+void AskHalfDuplex(TRuleRun& run) {
+  for (TElement const& port : run.Elements("CIM_EthernetPort")) {
+    if (!IsUp(port)) continue;
+    auto const isFull = port.Flag("FullDuplex");
+    if (run.Know(port, isFull) && !*isFull.fValue)
+      run.Add(port, isFull.fSource, ESeverity::kWarning, "the network port " + port.Label() + " uses half duplex",
+              "Let both ends negotiate the link, or set the same mode at both.");
+  }
+}
+
+// Many fast ports are connected to slower switches on purpose, but not at 100 Mbit/s: a broken pair of a cable causes that.
+void AskSlowPort(TRuleRun& run) {
+  constexpr std::uint64_t fast = 100000000, gigabit = 1000000000;
+  for (TElement const& port : run.Elements("CIM_EthernetPort")) {
+    if (!IsUp(port)) continue;
+    auto const speed = port.Number("Speed"), highest = port.Number("MaxSpeed");
+    if (!run.Know(port, speed) || !run.Know(port, highest)) continue;
+    if (*speed.fValue <= fast && *highest.fValue >= gigabit)
+      run.Add(port, speed.fSource, ESeverity::kWarning,
+              "the network port " + port.Label() + " runs at " + std::to_string(*speed.fValue / 1000000) +
+                  " Mbit/s, although it can run at " + std::to_string(*highest.fValue / 1000000),
+              kCheckCable);
+  }
+}
+
+// The interfaces that something depends on: those with an address, and the members of bridges. Members of bonds have a rule of
+// their own.
+std::set<std::string> InterfacesInUse(TRuleRun const& run) {
+  std::set<std::string> names;
+  for (TElement const& address : run.TryElements("CIM_IPProtocolEndpoint")) {
+    auto const name = address.Text("InterfaceName"), origin = address.Text("AddressOrigin");
+    constexpr char const *ipv4LinkLocal = "6", *ipv6LinkLocal = "10";  // the kernel and its services set these by themselves
+    bool const isSetOnPurpose = origin.IsKnown() && *origin.fValue != ipv4LinkLocal && *origin.fValue != ipv6LinkLocal;
+    if (name.IsKnown() && isSetOnPurpose) names.insert(*name.fValue);
+  }
+  for (TElement const& port : run.TryElements("ZEP_BridgePort")) names.insert(port.Label());
+  return names;
+}
+
+void AskUnpluggedPort(TRuleRun& run) {
+  auto const inUse = InterfacesInUse(run);
+  for (TElement const& port : run.Elements("CIM_EthernetPort")) {
+    auto const status = port.Texts("OperationalStatus");
+    if (!run.Know(port, status) || !IsEnabled(port) || IsUp(port) || inUse.count(port.Label()) == 0) continue;
+    run.Add(port, status.fSource, ESeverity::kError, "the network port " + port.Label() + " is in use, but has no link",
+            kCheckCable);
+  }
+}
+
+void AskBond(TRuleRun& run) {
+  for (TElement const& member : run.Elements("ZEP_BondMember")) {
+    auto const status = member.Text("MIIStatus");
+    if (!run.Know(member, status) || *status.fValue == "up") continue;
+    auto const bond = member.Text("BondName");
+    run.Add(member, status.fSource, ESeverity::kError,
+            "the bond " + (bond.IsKnown() ? *bond.fValue : "") + " lacks its member " + member.Label() + ", which has no link",
+            kCheckCable);
+  }
+  for (TElement const& bond : run.TryElements("ZEP_Bond")) {
+    auto const members = bond.Number("NumberOfMembers");
+    if (!run.Know(bond, members) || *members.fValue > 1) continue;
+    run.Add(bond, members.fSource, ESeverity::kWarning,
+            "the bond " + bond.Label() + (*members.fValue == 0 ? " has no member" : " has only one member"),
+            "Add the interfaces that belong to it.");
+  }
+}
+
+}  // namespace
+
+std::vector<TRule> NetworkRules() {
+  return {{"port-errors", "Does a network interface count errors?", AskPortErrors},
+          {"port-half-duplex", "Does a network port use half duplex?", AskHalfDuplex},
+          {"port-slow", "Is a network port far below its speed?", AskSlowPort},
+          {"port-unplugged", "Does a network port that is in use have no link?", AskUnpluggedPort},
+          {"bond-member", "Does a bond lack a member?", AskBond}};
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,425 @@
+// SPDX-License-Identifier: Apache-2.0
+
+// Each rule with instances that have a problem, that are fine, and that cannot be judged.
+
+#include "collect/findings/Findings.h"
+
+#include "TMemoryNamespace.h"
+#include "providers/mof/Mof.h"
+
+#include <gmock/gmock.h>
+#include <boost/make_shared.hpp>
+
+namespace NQRVZEP20 {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+// The classes that the rules read, with the properties that they use.
+constexpr char const* kClasses = R"(
+  Qualifier Key : boolean = false, Scope(property, reference), Flavor(DisableOverride);
+  Qualifier Association : boolean = false, Scope(association), Flavor(DisableOverride);
+  class CIM_MediaAccessDevice { [key] string DeviceID; uint16 OperationalStatus[]; string StatusDescriptions[]; };
+  class CIM_DiskDrive : CIM_MediaAccessDevice { uint16 HealthState; };
+  class ZEP_DiskHealth { [key] string InstanceID; string ElementName; uint8 PercentageUsed; uint8 AvailableSpare;
+    uint8 AvailableSpareThreshold; uint64 PendingSectors; uint64 UncorrectableErrors; uint64 ReallocatedSectors; };
+  class ZEP_RaidArray { [key] string DeviceID; string State; uint16 Members; uint16 MissingMembers; string Action;
+    uint16 PackageRedundancy; };
+  class CIM_LocalFileSystem { [key] string Name; string Root; string FileSystemType; boolean ReadOnly; uint64 FileSystemSize;
+    uint64 AvailableSpace; };
+  class CIM_UnixLocalFileSystem : CIM_LocalFileSystem { uint64 TotalInodes; uint64 FreeInodes; };
+  class ZEP_Mount { [key] string InstanceID; string ElementName; string Type; string Options; string FileSystemOptions; };
+  class ZEP_InterfaceStatistics { [key] string InstanceID; string ElementName; uint64 ReceiveErrors; uint64 TransmitErrors;
+    uint64 PacketsReceived; uint64 PacketsTransmitted; };
+  class CIM_EthernetPort { [key] string DeviceID; uint16 EnabledState; uint16 OperationalStatus[]; boolean FullDuplex;
+    uint64 Speed; uint64 MaxSpeed; };
+  class CIM_IPProtocolEndpoint { [key] string Name; string InterfaceName; uint16 AddressOrigin; };
+  class ZEP_BridgePort { [key] string Name; string ElementName; };
+  class ZEP_BondMember { [key] string Name; string ElementName; string BondName; string MIIStatus; };
+  class ZEP_Bond { [key] string InstanceID; string ElementName; uint32 NumberOfMembers; };
+  class CIM_PCIDevice { [key] string DeviceID; uint8 ClassCode; };
+  class ZEP_PCIExpressLink { [key] string DeviceID; uint16 Width; uint16 MaxWidth; real32 TransferRate; real32 MaxTransferRate; };
+  [association] class CIM_ControlledBy { [key] CIM_PCIDevice ref Antecedent; [key] CIM_PCIDevice ref Dependent; };
+  class CIM_Processor { [key] string DeviceID; string ElementName; string Stepping; };
+  class ZEP_ProcessorSettings { [key] string InstanceID; string MicrocodeVersion; };
+  class CIM_PhysicalMemory { [key] string Tag; string ElementName; string BankLabel; uint64 Capacity; uint16 MemoryType;
+    uint32 MaxMemorySpeed; };
+  class ZEP_Virtualization { [key] string InstanceID; boolean IsVirtual; };
+  class ZEP_ProcessorWeakness { [key] string Name; uint16 State; };
+  class ZEP_RunningState { [key] string InstanceID; uint64 Uptime; boolean ClockSynchronized; uint64 Taint; string FailedUnits[]; };
+  class ZEP_Finding { [key] string InstanceID; string Rule; string Severity; string Reason; string Remedy; string Element; };
+)";
+
+TFindings FindingsOf(std::string const& instances, TThresholds const& thresholds = {}) {
+  auto const ns = boost::make_shared<TMemoryNamespace>("root/test");
+  ReadMofText(kClasses + instances, "test", ns);
+  return MakeFindings({TNamespaceView("Test", ns)}, thresholds);
+}
+
+// The problems that the rule finds, as "severity: reason".
+std::vector<std::string> Problems(std::string const& rule, std::string const& instances, TThresholds const& thresholds = {}) {
+  std::vector<std::string> texts;
+  for (TProblem const& problem : FindingsOf(instances, thresholds).fProblems) {
+    EXPECT_FALSE(problem.fRemedy.empty()) << problem.fReason;
+    if (problem.fRule == rule) texts.push_back(NameOf(problem.fSeverity) + ": " + problem.fReason);
+  }
+  return texts;
+}
+
+TRuleResult ResultOf(std::string const& rule, TFindings const& findings) {
+  for (TRuleResult const& result : findings.fRules)
+    if (result.fId == rule) return result;
+  ADD_FAILURE() << "no rule " << rule;
+  return {};
+}
+
+std::string Outcome(std::string const& rule, std::string const& instances) {
+  return NameOf(ResultOf(rule, FindingsOf(instances)).fOutcome);
+}
+
+// ---- Disks ----
+
+TEST(RulesTest, AFailingDiskIsCritical) {
+  EXPECT_THAT(Problems("disk-failing", R"(instance of CIM_DiskDrive { DeviceID = "sda"; HealthState = 25; };
+                                          instance of CIM_DiskDrive { DeviceID = "sdb"; HealthState = 5; };)"),
+              ElementsAre("critical: the disk sda reports that it is failing (SMART)"));
+}
+
+TEST(RulesTest, ADiskOfUnknownHealthCannotBeJudged) {
+  EXPECT_EQ(Outcome("disk-failing", R"(instance of CIM_DiskDrive { DeviceID = "sda"; };)"), "not-asked");
+  EXPECT_EQ(Outcome("disk-failing", R"(instance of CIM_DiskDrive { DeviceID = "sda"; };
+                                       instance of CIM_DiskDrive { DeviceID = "sdb"; HealthState = 5; };)"),
+            "fine");
+}
+
+TEST(RulesTest, ADiskThatTheKernelCannotUseIsAnError) {
+  EXPECT_THAT(Problems("disk-lost", R"(
+      instance of CIM_DiskDrive { DeviceID = "sda"; OperationalStatus = {6}; StatusDescriptions = {"offline"}; };
+      instance of CIM_DiskDrive { DeviceID = "sdb"; OperationalStatus = {2}; };
+      instance of CIM_DiskDrive { DeviceID = "vda"; };)"),
+              ElementsAre("error: the kernel cannot use the disk sda (offline)"));
+}
+
+TEST(RulesTest, AWornDiskIsNamedWithItsWear) {
+  EXPECT_THAT(Problems("disk-worn", R"(
+      instance of ZEP_DiskHealth { InstanceID = "1"; ElementName = "nvme0n1"; PercentageUsed = 104; AvailableSpare = 4;
+                                   AvailableSpareThreshold = 10; };
+      instance of ZEP_DiskHealth { InstanceID = "2"; ElementName = "nvme1n1"; PercentageUsed = 89; AvailableSpare = 100;
+                                   AvailableSpareThreshold = 10; };
+      instance of ZEP_DiskHealth { InstanceID = "3"; ElementName = "sda"; };)"),
+              ElementsAre("error: the disk nvme0n1 has only 4 % of its spare blocks left",
+                          "warning: the disk nvme0n1 has used 104 % of its expected life"));
+}
+
+TEST(RulesTest, BadSectorsAreCounted) {
+  EXPECT_THAT(
+      Problems("disk-sectors", R"(
+      instance of ZEP_DiskHealth { InstanceID = "1"; ElementName = "sda"; PendingSectors = 8; UncorrectableErrors = 0;
+                                   ReallocatedSectors = 51; };
+      instance of ZEP_DiskHealth { InstanceID = "2"; ElementName = "sdb"; PendingSectors = 0; ReallocatedSectors = 50; };)"),
+      ElementsAre("error: the disk sda has 8 sectors that cannot be read", "warning: the disk sda has replaced 51 bad sectors"));
+}
+
+std::string Array(std::string const& state) {
+  return "instance of ZEP_RaidArray { DeviceID = \"md0\"; Members = 3; " + state + " };";
+}
+
+TEST(RulesTest, AnArrayIsJudgedByItsRedundancyAndState) {
+  std::string const rule = "array-degraded";
+  EXPECT_THAT(Problems(rule, Array("MissingMembers = 0; State = \"clean\";")), IsEmpty());
+  EXPECT_THAT(Problems(rule, Array("MissingMembers = 1; State = \"clean\"; PackageRedundancy = 0; Action = \"idle\";")),
+              ElementsAre("critical: the RAID array md0 is degraded: 1 of 3 members is missing"));
+  EXPECT_THAT(Problems(rule, Array("MissingMembers = 1; State = \"clean\"; PackageRedundancy = 1; Action = \"idle\";")),
+              ElementsAre("error: the RAID array md0 is degraded: 1 of 3 members is missing"));
+  EXPECT_THAT(Problems(rule, Array("MissingMembers = 1; State = \"clean\"; PackageRedundancy = 0; Action = \"recover\";")),
+              ElementsAre("warning: the RAID array md0 is being rebuilt: 1 of 3 members is missing"));
+  EXPECT_THAT(Problems(rule, Array("MissingMembers = 2; State = \"inactive\"; PackageRedundancy = 0;")),
+              ElementsAre("critical: the RAID array md0 does not run: 2 of 3 members are missing"));
+}
+
+// ---- File systems ----
+
+std::string FileSystem(std::string const& type, std::string const& size, std::string const& free, std::string const& more = "") {
+  return "instance of CIM_UnixLocalFileSystem { Name = \"/dev/sda1\"; Root = \"/data\"; FileSystemType = \"" + type +
+         "\"; FileSystemSize = " + size + "; AvailableSpace = " + free + "; " + more + " };";
+}
+
+TEST(RulesTest, AFileSystemIsNearlyFullByPercentAndBySize) {
+  std::string const rule = "file-system-full";
+  EXPECT_THAT(Problems(rule, FileSystem("ext4", "100000000000", "9000000000")),
+              ElementsAre("warning: the file system on /data is nearly full: 9 % free"));
+  EXPECT_THAT(Problems(rule, FileSystem("ext4", "100000000000", "10000000000")), IsEmpty());
+  EXPECT_THAT(Problems(rule, FileSystem("xfs", "10000000000000", "500000000000")), IsEmpty()) << "500 GB are enough";
+  EXPECT_THAT(Problems(rule, FileSystem("ext4", "100000000000", "0")), ElementsAre("error: the file system on /data is full"));
+  EXPECT_THAT(Problems(rule, FileSystem("squashfs", "100000000", "0")), IsEmpty()) << "an image is always full";
+  EXPECT_THAT(Problems(rule, FileSystem("ext4", "100000000000", "0", "ReadOnly = true;")), IsEmpty());
+  TThresholds thresholds;
+  thresholds.fFileSystemFreePercent = 5;
+  EXPECT_THAT(Problems(rule, FileSystem("ext4", "100000000000", "9000000000"), thresholds), IsEmpty());
+}
+
+TEST(RulesTest, AFileSystemThatIsNotMountedIsNotJudged) {
+  EXPECT_EQ(Outcome("file-system-full", R"(instance of CIM_LocalFileSystem { Name = "/dev/sdb1"; FileSystemType = "ext4"; };)"),
+            "fine");
+}
+
+TEST(RulesTest, AFileSystemWithoutInodesIsNamed) {
+  std::string const rule = "file-system-inodes";
+  EXPECT_THAT(Problems(rule, FileSystem("ext4", "9", "9", "TotalInodes = 1000; FreeInodes = 49;")),
+              ElementsAre("warning: the file system on /data has nearly no room for further files: 4 % of its inodes free"));
+  EXPECT_THAT(Problems(rule, FileSystem("ext4", "9", "9", "TotalInodes = 1000; FreeInodes = 50;")), IsEmpty());
+  EXPECT_THAT(Problems(rule, FileSystem("btrfs", "9", "9", "TotalInodes = 0; FreeInodes = 0;")), IsEmpty());
+}
+
+std::string Mount(std::string const& type, std::string const& options, std::string const& ofSystem) {
+  return "instance of ZEP_Mount { InstanceID = \"1\"; ElementName = \"/data\"; Type = \"" + type + "\"; Options = \"" + options +
+         "\"; FileSystemOptions = \"" + ofSystem + "\"; };";
+}
+
+TEST(RulesTest, AFileSystemThatBecameReadOnlyIsAnError) {
+  std::string const rule = "file-system-read-only";
+  EXPECT_THAT(Problems(rule, Mount("ext4", "rw,noatime", "ro,errors=remount-ro")),
+              ElementsAre("error: the file system on /data has become read-only"));
+  EXPECT_THAT(Problems(rule, Mount("ext4", "ro,noatime", "ro")), IsEmpty()) << "mounted so on purpose";
+  EXPECT_THAT(Problems(rule, Mount("ext4", "rw", "rw,errors=remount-ro")), IsEmpty());
+  EXPECT_THAT(Problems(rule, Mount("squashfs", "rw", "ro")), IsEmpty());
+}
+
+// ---- Network ----
+
+std::string Statistics(int received, int errors) {
+  return "instance of ZEP_InterfaceStatistics { InstanceID = \"1\"; ElementName = \"eth0\"; PacketsReceived = " +
+         std::to_string(received) + "; ReceiveErrors = " + std::to_string(errors) + "; TransmitErrors = 0; };";
+}
+
+TEST(RulesTest, ErrorsOfAPortAreJudgedByTheirShare) {
+  EXPECT_THAT(Problems("port-errors", Statistics(1000000, 11)),
+              ElementsAre("warning: the network interface eth0 has 11 errors in 1000011 packets"));
+  EXPECT_THAT(Problems("port-errors", Statistics(2000000, 11)), IsEmpty());
+  EXPECT_THAT(Problems("port-errors", Statistics(100, 9)), IsEmpty()) << "too few to judge";
+}
+
+std::string Port(std::string const& state) { return "instance of CIM_EthernetPort { DeviceID = \"eth0\"; " + state + " };"; }
+
+TEST(RulesTest, APortWithHalfDuplexOrFarBelowItsSpeedIsNamed) {
+  std::string const up = "EnabledState = 2; OperationalStatus = {2}; ";
+  EXPECT_THAT(Problems("port-half-duplex", Port(up + "FullDuplex = false;")),
+              ElementsAre("warning: the network port eth0 uses half duplex"));
+  EXPECT_THAT(Problems("port-half-duplex", Port(up + "FullDuplex = true;")), IsEmpty());
+  EXPECT_THAT(Problems("port-half-duplex", Port("OperationalStatus = {12}; FullDuplex = false;")), IsEmpty()) << "no link";
+  EXPECT_THAT(Problems("port-slow", Port(up + "Speed = 100000000; MaxSpeed = 1000000000;")),
+              ElementsAre("warning: the network port eth0 runs at 100 Mbit/s, although it can run at 1000"));
+  EXPECT_THAT(Problems("port-slow", Port(up + "Speed = 1000000000; MaxSpeed = 10000000000;")), IsEmpty());
+  EXPECT_EQ(Outcome("port-slow", Port(up)), "not-asked");
+}
+
+TEST(RulesTest, AnUnpluggedPortIsNamedOnlyIfItIsInUse) {
+  std::string const unplugged = Port("EnabledState = 2; OperationalStatus = {12};");
+  auto const address = [](int origin) {
+    return "instance of CIM_IPProtocolEndpoint { Name = \"1\"; InterfaceName = \"eth0\"; AddressOrigin = " +
+           std::to_string(origin) + "; };";
+  };
+  constexpr int fixed = 3, linkLocal = 10;
+  EXPECT_THAT(Problems("port-unplugged", unplugged + address(fixed)),
+              ElementsAre("error: the network port eth0 is in use, but has no link"));
+  EXPECT_THAT(Problems("port-unplugged", unplugged + R"(instance of ZEP_BridgePort { Name = "1"; ElementName = "eth0"; };)"),
+              ElementsAre("error: the network port eth0 is in use, but has no link"));
+  EXPECT_THAT(Problems("port-unplugged", unplugged), IsEmpty());
+  EXPECT_THAT(Problems("port-unplugged", unplugged + address(linkLocal)), IsEmpty());
+  EXPECT_THAT(Problems("port-unplugged", Port("EnabledState = 3; OperationalStatus = {10};") + address(fixed)), IsEmpty())
+      << "switched off on purpose";
+  EXPECT_THAT(Problems("port-unplugged", Port("EnabledState = 2; OperationalStatus = {2};") + address(fixed)), IsEmpty());
+}
+
+TEST(RulesTest, ABondWithoutAMemberIsNamed) {
+  EXPECT_THAT(Problems("bond-member", R"(
+      instance of ZEP_BondMember { Name = "1"; ElementName = "eth0"; BondName = "bond0"; MIIStatus = "down"; };
+      instance of ZEP_BondMember { Name = "2"; ElementName = "eth1"; BondName = "bond0"; MIIStatus = "up"; };
+      instance of ZEP_Bond { InstanceID = "bond0"; ElementName = "bond0"; NumberOfMembers = 2; };)"),
+              ElementsAre("error: the bond bond0 lacks its member eth0, which has no link"));
+  EXPECT_THAT(Problems("bond-member", R"(
+      instance of ZEP_Bond { InstanceID = "bond0"; ElementName = "bond0"; NumberOfMembers = 1; };)"),
+              ElementsAre("warning: the bond bond0 has only one member"));
+}
+
+// ---- Devices ----
+
+// A bridge with 16 lanes of 16 GT/s and the device below it.
+std::string Link(std::string const& device, std::string const& classCode) {
+  return R"(instance of CIM_PCIDevice as $bridge { DeviceID = "00:01.0"; ClassCode = 6; };
+            instance of CIM_PCIDevice as $device { DeviceID = "01:00.0"; ClassCode = )" +
+         classCode + R"(; };
+            instance of CIM_ControlledBy { Antecedent = $bridge; Dependent = $device; };
+            instance of ZEP_PCIExpressLink { DeviceID = "00:01.0"; Width = 4; MaxWidth = 16; TransferRate = 2.5;
+                                             MaxTransferRate = 16.0; };
+            instance of ZEP_PCIExpressLink { DeviceID = "01:00.0"; )" +
+         device + " };";
+}
+
+TEST(RulesTest, ALinkIsComparedWithBothEnds) {
+  std::string const rule = "pci-link", network = "2", display = "3";
+  EXPECT_THAT(Problems(rule, Link("Width = 4; MaxWidth = 8; TransferRate = 8.0; MaxTransferRate = 8.0;", network)),
+              ElementsAre("warning: the PCI Express link of 01:00.0 has 4 of the 8 lanes that both ends have"));
+  std::string const slow = "Width = 8; MaxWidth = 8; TransferRate = 2.5; MaxTransferRate = 32.0;";
+  EXPECT_THAT(Problems(rule, Link(slow, network)),
+              ElementsAre("warning: the PCI Express link of 01:00.0 runs at 2.5 GT/s, although both ends can run at 16 GT/s"));
+  EXPECT_THAT(Problems(rule, Link(slow, display)), IsEmpty()) << "a display controller saves power";
+  EXPECT_THAT(Problems(rule, Link("Width = 16; MaxWidth = 32; TransferRate = 16.0; MaxTransferRate = 32.0;", network)), IsEmpty())
+      << "the bridge allows no more";
+  EXPECT_THAT(Problems(rule, Link("Width = 4;", network)), IsEmpty());
+}
+
+// ---- Host ----
+
+TEST(RulesTest, ProcessorsOfDifferentSteppingOrMicrocodeAreNamed) {
+  EXPECT_THAT(Problems("processors-differ", R"(
+      instance of CIM_Processor { DeviceID = "0"; ElementName = "Xeon"; Stepping = "6"; };
+      instance of CIM_Processor { DeviceID = "1"; ElementName = "Xeon"; Stepping = "7"; };
+      instance of ZEP_ProcessorSettings { InstanceID = "0"; MicrocodeVersion = "0x1"; };
+      instance of ZEP_ProcessorSettings { InstanceID = "1"; MicrocodeVersion = "0x2"; };)"),
+              ElementsAre("warning: the processors are of different kinds (Stepping: 6, 7)",
+                          "warning: the processors have different microcode (MicrocodeVersion: 0x1, 0x2)"));
+  EXPECT_THAT(Problems("processors-differ", R"(
+      instance of CIM_Processor { DeviceID = "0"; ElementName = "Xeon"; Stepping = "6"; };
+      instance of CIM_Processor { DeviceID = "1"; ElementName = "Xeon"; Stepping = "6"; };)"),
+              IsEmpty());
+}
+
+std::string Module(std::string const& tag, std::string const& bank, std::string const& capacity) {
+  return "instance of CIM_PhysicalMemory { Tag = \"" + tag + "\"; BankLabel = \"" + bank + "\"; Capacity = " + capacity + "; };";
+}
+
+TEST(RulesTest, ModulesAreComparedWithinTheirChannel) {
+  EXPECT_THAT(Problems("memory-differs", Module("0", "P0 CHANNEL A", "8") + Module("1", "P0 CHANNEL A", "16")),
+              ElementsAre("warning: the memory modules of the channel P0 CHANNEL A do not match (Capacity: 16, 8)"));
+  EXPECT_THAT(Problems("memory-differs", Module("0", "P0 CHANNEL A", "8") + Module("1", "P0 CHANNEL B", "16")), IsEmpty());
+  EXPECT_THAT(Problems("memory-differs", Module("0", "BANK 0", "8") + Module("1", "BANK 0", "16")), IsEmpty());
+}
+
+TEST(RulesTest, WeaknessesWithoutMitigationAreListed) {
+  std::string const weaknesses = R"(instance of ZEP_ProcessorWeakness { Name = "mds"; State = 4; };
+                                    instance of ZEP_ProcessorWeakness { Name = "retbleed"; State = 4; };
+                                    instance of ZEP_ProcessorWeakness { Name = "meltdown"; State = 3; };)";
+  std::string const reason = ": the kernel mitigates some weaknesses of the processor incompletely or not at all: mds, retbleed";
+  EXPECT_THAT(Problems("processor-weakness", weaknesses), ElementsAre("warning" + reason));
+  EXPECT_THAT(
+      Problems("processor-weakness", weaknesses + R"(instance of ZEP_Virtualization { InstanceID = "1"; IsVirtual = true; };)"),
+      ElementsAre("information" + reason));
+  EXPECT_THAT(Problems("processor-weakness", R"(instance of ZEP_ProcessorWeakness { Name = "mds"; State = 2; };)"), IsEmpty());
+}
+
+// ---- The running system ----
+
+std::string State(std::string const& state) { return "instance of ZEP_RunningState { InstanceID = \"1\"; " + state + " };"; }
+
+TEST(RulesTest, AClockIsJudgedSomeTimeAfterTheStart) {
+  EXPECT_THAT(Problems("clock-synchronized", State("Uptime = 900; ClockSynchronized = false;")),
+              ElementsAre("warning: the clock is not synchronised"));
+  EXPECT_THAT(Problems("clock-synchronized", State("Uptime = 900; ClockSynchronized = true;")), IsEmpty());
+  EXPECT_EQ(Outcome("clock-synchronized", State("Uptime = 899; ClockSynchronized = false;")), "not-asked");
+}
+
+TEST(RulesTest, OnlyTaintsThatShowAFaultAreNamed) {
+  EXPECT_THAT(Problems("kernel-taint", State("Taint = 16;")),
+              ElementsAre("error: a processor has reported a machine check exception since the start"));
+  EXPECT_THAT(Problems("kernel-taint", State("Taint = 640;")),
+              ElementsAre("error: the kernel has had an internal error (OOPS or BUG) since the start",
+                          "information: the kernel has issued a warning about its own state since the start"));
+  EXPECT_THAT(Problems("kernel-taint", State("Taint = 12289;")), IsEmpty()) << "proprietary, foreign and unsigned modules";
+}
+
+TEST(RulesTest, FailedUnitsAreNamedUpToFive) {
+  EXPECT_THAT(Problems("failed-units", State(R"(FailedUnits = {"a", "b", "c", "d", "e", "f", "g"};)")),
+              ElementsAre("warning: units of systemd have failed: a, b, c, d, e and 2 more"));
+  EXPECT_THAT(Problems("failed-units", State("FailedUnits = {};")), IsEmpty());
+}
+
+// ---- Plug-ins ----
+
+TEST(RulesTest, AProblemOfAPlugInHasItsOwnRule) {
+  auto const findings = FindingsOf(R"(instance of ZEP_Finding { InstanceID = "1"; Rule = "pump-pressure"; Severity = "error";
+      Reason = "the pressure of pump 1 is 0.2 bar"; Remedy = "Check the pump."; Element = "X_Pump.Id=1"; };
+      instance of ZEP_Finding { InstanceID = "2"; Severity = "dreadful"; Reason = "r"; };)");
+  ASSERT_EQ(findings.fProblems.size(), 1u);
+  EXPECT_EQ(findings.fProblems[0].fRule, "pump-pressure");
+  EXPECT_EQ(findings.fProblems[0].fReason, "the pressure of pump 1 is 0.2 bar");
+  EXPECT_EQ(findings.fProblems[0].fInstance, "X_Pump.Id=1");
+  auto const& notAsked = ResultOf("plug-in", findings).fNotAsked;
+  ASSERT_EQ(notAsked.size(), 1u);
+  EXPECT_EQ(notAsked[0].fReason, "\"dreadful\" is not a severity");
+}
+
+// ---- All rules ----
+
+TEST(RulesTest, NothingIsWrongWithoutInstances) {
+  auto const findings = FindingsOf("");
+  EXPECT_THAT(findings.fProblems, IsEmpty());
+  EXPECT_EQ(findings.CountOf(TRuleResult::EOutcome::kFine), findings.fRules.size());
+}
+
+TEST(RulesTest, WithoutProvidersNoRuleCanBeAskedButThatOfPlugIns) {
+  auto const findings = MakeFindings({});
+  EXPECT_THAT(findings.fProblems, IsEmpty());
+  for (TRuleResult const& rule : findings.fRules)
+    EXPECT_EQ(NameOf(rule.fOutcome), rule.fId == "plug-in" ? "fine" : "not-asked") << rule.fId;
+}
+
+TEST(RulesTest, TheWorstProblemComesFirst) {
+  auto const findings = FindingsOf(State("Taint = 16; FailedUnits = {\"a\"};") +
+                                   "instance of CIM_DiskDrive { DeviceID = \"sda\"; HealthState = 25; };");
+  std::vector<std::string> rules;
+  for (TProblem const& problem : findings.fProblems) rules.push_back(problem.fRule);
+  EXPECT_THAT(rules, ElementsAre("disk-failing", "kernel-taint", "failed-units"));
+  EXPECT_EQ(findings.Worst(), ESeverity::kCritical);
+}
+
+TEST(RulesTest, AProblemNamesItsInstanceAndSource) {
+  auto const findings = FindingsOf("instance of CIM_DiskDrive { DeviceID = \"sda\"; HealthState = 25; };");
+  ASSERT_EQ(findings.fProblems.size(), 1u);
+  EXPECT_EQ(findings.fProblems[0].fInstance, "root/test:CIM_DiskDrive.DeviceID=\"sda\"");
+  EXPECT_EQ(findings.fProblems[0].fSource, "provider Test");
+}
+
+TEST(RulesTest, ARuleThatThrowsCountsAsNotAskedAndKeepsItsProblems) {
+  auto const add = [](TRuleRun& run) { run.Add({"", ESeverity::kWarning, "before", "Do it.", "", ""}); };
+  auto const findings =
+      MakeFindings({}, {}, {{"a", "A?", [](TRuleRun&) { throw 5; }}, {"b", "B?", [&](TRuleRun& run) {
+                                                                        add(run);
+                                                                        throw std::runtime_error("out of order");
+                                                                      }}});
+  EXPECT_EQ(NameOf(findings.fRules[0].fOutcome), "not-asked");
+  EXPECT_EQ(NameOf(findings.fRules[1].fOutcome), "wrong");
+  EXPECT_EQ(findings.fRules[1].fNotAsked.at(0).fReason, "the rule failed: out of order");
+  ASSERT_EQ(findings.fProblems.size(), 1u);
+  EXPECT_EQ(findings.fProblems[0].fRule, "b");
+}
+
+// ---- Thresholds and severities ----
+
+TEST(ThresholdsTest, SettingsReplaceDefaults) {
+  auto const thresholds =
+      TThresholds::From([](std::string const& key) { return key == "finding-file-system-free-percent" ? "7" : std::string(); });
+  EXPECT_EQ(thresholds.fFileSystemFreePercent, 7u);
+  EXPECT_EQ(thresholds.fFreeInodesPercent, 5u);
+}
+
+TEST(ThresholdsTest, AValueOutOfRangeIsRefusedWithItsKeyAndRange) {
+  for (std::string const value : {"101", "-1", "many", "5 "}) {
+    try {
+      TThresholds::From([&](std::string const& key) { return key == "finding-free-inodes-percent" ? value : std::string(); });
+      ADD_FAILURE() << value << " was accepted";
+    } catch (std::invalid_argument const& failure) {
+      EXPECT_EQ(failure.what(), "setting finding-free-inodes-percent: \"" + value + "\" is not a whole number from 0 to 100");
+    }
+  }
+}
+
+TEST(SeverityTest, NamesAndSeveritiesCorrespond) {
+  for (std::string const name : {"information", "warning", "error", "critical"}) EXPECT_EQ(NameOf(*SeverityFrom(name)), name);
+  EXPECT_FALSE(SeverityFrom("Warning"));
+  EXPECT_LT(ESeverity::kWarning, ESeverity::kError);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

@@ -1,0 +1,143 @@
+// SPDX-License-Identifier: Apache-2.0
+
+// The findings of zep report, run as users run it, on recorded machines.
+
+#include "tests/Machines.h"
+#include "tests/tools/zep/Zep.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+using testing::AllOf;
+using testing::ElementsAre;
+using testing::HasSubstr;
+using testing::IsEmpty;
+using testing::Not;
+
+class FindingsTextTest : public testing::Test {
+protected:
+  static void SetUpTestSuite() {
+    fInstalled = new TInstallation;
+    for (char const* library : {"libStorage.nsp.so", "libNetwork.nsp.so", "libDevices.nsp.so"})
+      fInstalled->Add(library, std::string(TEST_LIB_DIR "/") + library);
+  }
+  static void TearDownTestSuite() {
+    delete fInstalled;
+    Machines().clear();
+  }
+
+  TRun Report(std::string const& machine, std::vector<std::string> arguments = {}) const {
+    auto const recorded = Machines().try_emplace(machine, machine).first;
+    arguments.insert(arguments.begin(), "report");
+    return fInstalled->Run({arguments, {{"ZEP_ROOT", recorded->second.Root()}}, false, false, false, "", -1, fDir.Path()});
+  }
+
+  // The problems of the document, as "severity rule".
+  static std::vector<std::string> ProblemsOf(nlohmann::json const& document) {
+    std::vector<std::string> problems;
+    for (nlohmann::json const& problem : document["findings"]["problems"])
+      problems.push_back(problem["severity"].get<std::string>() + " " + problem["rule"].get<std::string>());
+    return problems;
+  }
+
+  // The recorded machines in use, by name; each is unpacked once.
+  static std::map<std::string, TRecordedMachine>& Machines() {
+    static std::map<std::string, TRecordedMachine> machines;
+    return machines;
+  }
+
+  static TInstallation* fInstalled;
+  TTempDir const fDir;  // the working directory, which may have settings
+};
+
+TInstallation* FindingsTextTest::fInstalled = nullptr;
+
+TEST_F(FindingsTextTest, TheFaultsOfADegradedMachineAreFound) {
+  nlohmann::json const document = JsonOf(Report("degraded", {"--json"}));
+  EXPECT_THAT(ProblemsOf(document), ElementsAre("critical array-degraded", "error file-system-full", "error bond-member"));
+  nlohmann::json const& array = document["findings"]["problems"][0];
+  EXPECT_EQ(array["reason"], "the RAID array md0 is degraded: 1 of 2 members is missing");
+  EXPECT_EQ(array["remedy"], "Replace the failed disk and add the new one (mdadm --add).");
+  EXPECT_THAT(array["instance"].get<std::string>(), AllOf(HasSubstr("ZEP_RaidArray"), HasSubstr("DeviceID=\"md0\"")));
+  EXPECT_EQ(document["findings"]["worst"], "critical");
+}
+
+TEST_F(FindingsTextTest, HealthyMachinesHaveNone) {
+  for (char const* machine : {"server", "network"}) {
+    nlohmann::json const document = JsonOf(Report(machine, {"--json"}));
+    EXPECT_THAT(ProblemsOf(document), IsEmpty()) << machine;
+    EXPECT_TRUE(document["findings"]["worst"].is_null());
+  }
+}
+
+TEST_F(FindingsTextTest, EveryRuleHasAnAnswerAndEveryUnansweredOneAReason) {
+  nlohmann::json const findings = JsonOf(Report("server", {"--json"}))["findings"];
+  EXPECT_GE(findings["rules"].size(), 21u);
+  for (nlohmann::json const& rule : findings["rules"]) {
+    EXPECT_THAT(rule["question"].get<std::string>(), testing::EndsWith("?"));
+    if (rule["outcome"] == "not-asked") {
+      EXPECT_FALSE(rule["notExamined"].empty()) << rule;
+    }
+    for (nlohmann::json const& element : rule["notExamined"]) EXPECT_FALSE(element["reason"].get<std::string>().empty()) << rule;
+  }
+  EXPECT_EQ(findings["thresholds"]["finding-file-system-free-percent"], 10);
+}
+
+TEST_F(FindingsTextTest, TheTextBeginsWithTheProblemsAndTheirRemedies) {
+  std::string const text = Report("degraded").fOutput;
+  EXPECT_THAT(text, HasSubstr("\n\nFindings: 1 critical, 2 errors ("));
+  EXPECT_THAT(text, HasSubstr("\ncritical     the RAID array md0 is degraded: 1 of 2 members is missing.\n"
+                              "             Replace the failed disk and add the new one (mdadm --add).\n"
+                              "error        the file system on /data is full.\n"
+                              "             Delete what is not needed, or enlarge the file system.\n"
+                              "error        the bond bond0 lacks its member eth0, which has no link.\n"));
+  EXPECT_LT(text.find("Findings:"), text.find("Identity"));
+  EXPECT_THAT(Report("server").fOutput, HasSubstr("\nFindings: nothing wrong ("));
+}
+
+TEST_F(FindingsTextTest, TheSectionListsEveryRule) {
+  std::string const text = Report("degraded", {"--section", "findings"}).fOutput;
+  EXPECT_THAT(text, AllOf(HasSubstr("\ndisk-failing "), HasSubstr("\nfailed-units "), Not(HasSubstr("Identity"))));
+}
+
+TEST_F(FindingsTextTest, FailOnGivesStatus3ForThatSeverityOrAWorseOne) {
+  EXPECT_NE(Report("degraded").fStatus, 3);
+  EXPECT_EQ(Report("degraded", {"--fail-on", "error"}).fStatus, 3);
+  EXPECT_EQ(Report("degraded", {"--fail-on", "critical"}).fStatus, 3);
+  EXPECT_NE(Report("server", {"--fail-on", "information"}).fStatus, 3);
+  TRun const run = Report("degraded", {"--fail-on", "warning", "--json"});
+  nlohmann::json const document = JsonOf(run);
+  EXPECT_EQ(run.fStatus, 3);
+  EXPECT_EQ(document["exitStatus"], 3);
+  EXPECT_EQ(document["reason"], "1 critical, 2 errors");
+}
+
+TEST_F(FindingsTextTest, AnUnknownSeverityIsWrongUsage) {
+  TRun const run = Report("server", {"--fail-on", "dreadful"});
+  EXPECT_EQ(run.fStatus, 64);
+  EXPECT_THAT(run.fErrors, HasSubstr("--fail-on takes information, warning, error or critical"));
+}
+
+TEST_F(FindingsTextTest, SettingsChangeThresholdsAndAreNamed) {
+  WriteFile(fDir.Path("zep.cfg"), "finding-clock-grace-minutes=1\n");
+  EXPECT_THAT(Report("server").fOutput, HasSubstr("thresholds   set in zep.cfg: finding-clock-grace-minutes=1\n"));
+  WriteFile(fDir.Path("zep.cfg"), "finding-clock-grace-minutes=soon\n");
+  TRun const run = Report("server");
+  EXPECT_EQ(run.fStatus, 64);
+  EXPECT_THAT(run.fErrors, HasSubstr("setting finding-clock-grace-minutes: \"soon\" is not a whole number from 0 to 1000000"));
+}
+
+TEST_F(FindingsTextTest, ASampleIsJudgedOnlyByItsOwnInstances) {
+  nlohmann::json const document = JsonOf(fInstalled->Run({{"report", "--sample", "--json"}}));
+  EXPECT_THAT(ProblemsOf(document), IsEmpty());
+  for (nlohmann::json const& rule : document["findings"]["rules"])
+    if (rule["id"] == "clock-synchronized") {
+      EXPECT_EQ(rule["notExamined"][0]["reason"], "the sample does not describe them");
+    }
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,106 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/zep/output/FindingsText.h"
+
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/secrets/Secrets.h"
+
+#include <algorithm>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+using EOutcome = TRuleResult::EOutcome;
+
+constexpr std::size_t kIndent = 13;  // the width of "information" and two blanks
+
+std::string Counted(std::size_t count, ESeverity severity) {
+  bool const hasPlural = severity == ESeverity::kWarning || severity == ESeverity::kError;
+  return std::to_string(count) + " " + NameOf(severity) + (hasPlural && count != 1 ? "s" : "");
+}
+
+std::string Paragraph(std::string const& text) { return Joined(Wrapped(Printable(text), OutputWidth()), "\n") + "\n"; }
+
+// The text in lines that begin at the same column; `head` stands before the first.
+std::string Indented(std::string const& head, std::string const& text) {
+  std::size_t const width = OutputWidth() > 2 * kIndent ? OutputWidth() - kIndent : kIndent;
+  std::string lines;
+  for (std::string const& line : Wrapped(Printable(MessageWithoutSecrets(text)), width)) {
+    std::string const before = lines.empty() ? head : "";
+    lines += before + std::string(kIndent - before.size(), ' ') + line + "\n";
+  }
+  return lines;
+}
+
+std::string AskedText(TFindings const& findings) {
+  std::size_t const notAsked = findings.CountOf(EOutcome::kNotAsked), asked = findings.fRules.size() - notAsked;
+  return std::to_string(asked) + (asked == 1 ? " rule asked" : " rules asked") +
+         (notAsked == 0 ? "" : ", " + std::to_string(notAsked) + " could not be");
+}
+
+// The thresholds that the settings have changed; empty if there are none.
+std::string ChangedThresholds(TFindings const& findings) {
+  auto const defaults = TThresholds().Settings(), settings = findings.fThresholds.Settings();
+  std::string text;
+  for (std::size_t i = 0; i < settings.size(); ++i)
+    if (settings[i] != defaults[i])
+      text += (text.empty() ? "" : ", ") + settings[i].first + "=" + std::to_string(settings[i].second);
+  return text;
+}
+
+// The rules that could not be asked, grouped by the reason: "disk-failing, disk-worn: only root may read it".
+std::vector<std::string> ReasonsOf(TFindings const& findings) {
+  std::vector<std::pair<std::string, std::string>> groups;  // a reason, and the rules
+  for (TRuleResult const& rule : findings.fRules) {
+    if (rule.fOutcome != EOutcome::kNotAsked) continue;
+    std::string const& reason = rule.fNotAsked.front().fReason;
+    auto const group = std::find_if(groups.begin(), groups.end(), [&](auto const& each) { return each.first == reason; });
+    if (group == groups.end())
+      groups.emplace_back(reason, rule.fId);
+    else
+      group->second += ", " + rule.fId;
+  }
+  std::vector<std::string> texts;
+  for (auto const& [reason, rules] : groups) texts.push_back(rules + ": " + reason);
+  return texts;
+}
+
+std::string OutcomeText(TRuleResult const& rule) {
+  if (rule.fOutcome == EOutcome::kWrong) return "wrong";
+  if (rule.fOutcome == EOutcome::kNotAsked) return "not asked: " + rule.fNotAsked.front().fReason;
+  std::string const fine = rule.fExamined == 0 ? "fine: nothing to examine" : "fine";
+  if (rule.fNotAsked.empty()) return fine;
+  return fine + ", but " + std::to_string(rule.fNotAsked.size()) + " not examined: " + rule.fNotAsked.front().fReason;
+}
+
+}  // namespace
+
+std::string CountsOf(TFindings const& findings) {
+  std::string text;
+  for (ESeverity const severity : {ESeverity::kCritical, ESeverity::kError, ESeverity::kWarning, ESeverity::kInformation}) {
+    auto const count = std::count_if(findings.fProblems.begin(), findings.fProblems.end(),
+                                     [&](TProblem const& problem) { return problem.fSeverity == severity; });
+    if (count > 0) text += (text.empty() ? "" : ", ") + Counted(static_cast<std::size_t>(count), severity);
+  }
+  return text.empty() ? "nothing wrong" : text;
+}
+
+std::string FindingsAsText(TFindings const& findings, std::string const& label) {
+  std::string text = Paragraph(label + "Findings: " + CountsOf(findings) + " (" + AskedText(findings) + ")");
+  for (TProblem const& problem : findings.fProblems)
+    text += Indented(NameOf(problem.fSeverity), problem.fReason + ".") + Indented("", problem.fRemedy);
+  for (std::string const& reason : ReasonsOf(findings)) text += Indented("not asked", reason);
+  if (std::string const changed = ChangedThresholds(findings); !changed.empty())
+    text += Indented("thresholds", "set in zep.cfg: " + changed);
+  return text;
+}
+
+std::string RulesAsText(TFindings const& findings, std::string const& label) {
+  TTable table({22, 34, 20});
+  table.Add({label + "Rule", "Question", "Answer"});
+  for (TRuleResult const& rule : findings.fRules) table.Add({rule.fId, rule.fTitle, MessageWithoutSecrets(OutcomeText(rule))});
+  return table.GetText();
+}
+
+}  // namespace NQRVZEP20::zep
