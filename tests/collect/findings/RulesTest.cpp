@@ -6,6 +6,7 @@
 
 #include "TMemoryNamespace.h"
 #include "providers/mof/Mof.h"
+#include "tests/Support.h"
 
 #include <gmock/gmock.h>
 #include <boost/make_shared.hpp>
@@ -18,6 +19,9 @@ using testing::IsEmpty;
 
 // The classes that the rules read, with the properties that they use.
 constexpr char const* kClasses = R"(
+  Qualifier Description : string, Scope(any);
+  Qualifier ValueMap : string[], Scope(property);
+  class CIM_ManagedElement {};
   Qualifier Key : boolean = false, Scope(property, reference), Flavor(DisableOverride);
   Qualifier Association : boolean = false, Scope(association), Flavor(DisableOverride);
   class CIM_MediaAccessDevice { [key] string DeviceID; uint16 OperationalStatus[]; string StatusDescriptions[]; };
@@ -48,12 +52,13 @@ constexpr char const* kClasses = R"(
   class ZEP_Virtualization { [key] string InstanceID; boolean IsVirtual; };
   class ZEP_ProcessorWeakness { [key] string Name; uint16 State; };
   class ZEP_RunningState { [key] string InstanceID; uint64 Uptime; boolean ClockSynchronized; uint64 Taint; string FailedUnits[]; };
-  class ZEP_Finding { [key] string InstanceID; string Rule; string Severity; string Reason; string Remedy; string Element; };
 )";
 
 TFindings FindingsOf(std::string const& instances, TThresholds const& thresholds = {}) {
   auto const ns = boost::make_shared<TMemoryNamespace>("root/test");
-  ReadMofText(kClasses + instances, "test", ns);
+  ReadMofText(kClasses, "classes", ns);
+  ReadMofFile(SourcePath("collect/findings/ZEP_Finding.mof"), ns);
+  ReadMofText(instances, "instances", ns);
   return MakeFindings({TNamespaceView("Test", ns)}, thresholds);
 }
 
