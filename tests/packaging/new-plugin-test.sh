@@ -7,6 +7,7 @@
 #   new-plugin-test.sh BUILD_DIR CXX
 set -euo pipefail
 export LC_ALL=C
+unset ZEP_DMTF_SCHEMA
 build=$1 cxx=$2
 here=$(cd "$(dirname "$0")" && pwd)
 work=$(realpath "$(mktemp -d)")
@@ -53,4 +54,30 @@ sed -i 's/values.Set("Number", TCIMValue());/values.Set("Number", 1);/; s/values
 sed -i 's/uint8 U8;/uint8 U9;/' Everything/Everything.mof
 cmake --build project >"$work/log" || fail "it is not built:" "$work/log"
 ctest --test-dir project --output-on-failure >"$work/log" || fail "its test fails after a change of the MOF file:" "$work/log"
+
+# The kit carries a part of the schema of the DMTF, with its notice, if the build has found that schema.
+schema=$work/prefix/share/zepcore/schema
+reduced=$(find "$schema" -name 'cim_schema_*-reduced.mof' 2>/dev/null || true)
+if [[ -n $reduced ]]; then
+  grep -q 'provided that correct attribution is given' "$reduced" || fail "the schema has lost its notice" "$reduced"
+  [[ $(stat -c %s "$reduced") -lt 3000000 ]] || fail "the schema is not small"
+  "$zep" plugin new Fan --class CIM_Fan >"$work/log" 2>&1 || fail "CIM_Fan is not found:" "$work/log"
+  cmake -G Ninja -S Fan -B fan -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/log" || fail "it is not configured:" "$work/log"
+  cmake --build fan >"$work/log" || fail "it is not built:" "$work/log"
+  ctest --test-dir fan --output-on-failure >"$work/log" || fail "its test fails:" "$work/log"
+  grep -q 'Reproduced with attribution' Fan/Fan.mof || fail "Fan.mof has no attribution" Fan/Fan.mof
+  "$zep" plugin check fan/libFan.nsp.so >"$work/log" 2>&1 || fail "zep plugin check finds faults:" "$work/log"
+  grep -q '^schema  *passed' "$work/log" || fail "it is not checked against the schema of the kit:" "$work/log"
+
+  # --mof and ZEP_DMTF_SCHEMA come before it.
+  "$zep" plugin new ByMof --class X_Everything --mof "$here/everything.mof" >"$work/log" 2>&1 || fail "--mof does not count:" "$work/log"
+  ZEP_DMTF_SCHEMA=$here/everything.mof "$zep" plugin new ByVariable --class X_Everything >"$work/log" 2>&1 ||
+    fail "ZEP_DMTF_SCHEMA does not count:" "$work/log"
+  rm -r "$schema"
+else
+  [[ ${CI:-} != true ]] || fail "the build has not found the schema of the DMTF (ZEP_DMTF_SCHEMA)"
+  echo "the build has not found the schema of the DMTF: it is not tested"
+fi
+! "$zep" plugin new Lost --class CIM_Fan >"$work/log" 2>&1 || fail "a class without a schema is found"
+grep -q '^zep: there is no schema; name a MOF file with --mof, or ' "$work/log" || fail "the remedy is missing:" "$work/log"
 echo "the project of a new plug-in works"

@@ -72,7 +72,8 @@ void AddNew(CLI::App& command, TArguments& arguments) {
   command.footer(
       "The directory has a CMake project: the source of the provider with every property of the class, the class in MOF,\n"
       "a test and a README. Without --mof the class is searched in the CIM schema of the DMTF: in the directory that\n"
-      "ZEP_DMTF_SCHEMA names, where its archive is unpacked, or in share/zepcore/schema of the installation.\n"
+      "ZEP_DMTF_SCHEMA names, where its archive is unpacked, or in share/zepcore/schema of the installation, where the\n"
+      "package libzepcore-dev has a reduced form of it.\n"
       "Exit status: 0 when the directory was written, 1 when it was not, 64 for wrong usage.");
 }
 
