@@ -204,5 +204,26 @@ TEST_F(PluginsTest, RootPassesOverAPlugInThatOthersMayWrite) {
   EXPECT_EQ(Run({"report", "--sample", "--allow-writable"}).fStatus, 0);
 }
 
+TEST_F(PluginsTest, RootPassesOverPlugInsBelowADirectoryThatOthersMayWrite) {
+  NEEDS(::geteuid() == 0, "root");
+  fZep.Add("libTest.nsp.so", TEST_PROVIDER);
+  for (std::string const& directory : {fZep.Path("lib"), fs::path(fZep.Path("lib")).parent_path().string()}) {
+    SCOPED_TRACE(directory);
+    fs::perms const before = fs::status(directory).permissions();
+    fs::permissions(directory, fs::perms::others_write, fs::perm_options::add);
+    TRun const run = Run({"plugins", "--json"});
+    EXPECT_EQ(run.fStatus, 1);
+    for (char const* file : {"libTest.nsp.so", "libHost.nsp.so"}) {
+      EXPECT_EQ(EntryOf(JsonOf(run), file)["rule"], "writable");
+      EXPECT_EQ(EntryOf(JsonOf(run), file)["reason"],
+                "it would run as root, but every user may write " + directory + "; --allow-writable loads it nevertheless");
+    }
+    EXPECT_EQ(Run({"report", "--sample"}).fStatus, 1);
+    EXPECT_EQ(Run({"report", "--sample", "--allow-writable"}).fStatus, 0);
+    EXPECT_EQ(EntryOf(JsonOf(Run({"plugins", "--json", "--allow-writable"})), "libTest.nsp.so")["loaded"], true);
+    fs::permissions(directory, before);
+  }
+}
+
 }  // namespace
 }  // namespace NQRVZEP20::zep
