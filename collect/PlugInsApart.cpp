@@ -7,6 +7,7 @@
 #include "collect/process/TPlugInProcess.h"
 
 #include <poll.h>
+#include <sched.h>
 
 #include <algorithm>
 #include <map>
@@ -22,6 +23,13 @@ using TClock = TPlugInProcess::TClock;
 constexpr std::chrono::milliseconds kShowEvery(100);
 constexpr std::chrono::milliseconds kLongestWait(200);  // so that a stop of this process is noticed soon
 
+// The number of processors that this process may use.
+std::size_t Processors() {
+  cpu_set_t usable;
+  bool const isKnown = ::sched_getaffinity(0, sizeof usable, &usable) == 0;  // not on a machine with more than 1024
+  return isKnown ? static_cast<std::size_t>(CPU_COUNT(&usable)) : std::max(1u, std::thread::hardware_concurrency());
+}
+
 // The processes of all plug-ins, in the order of the plug-ins.
 class TPool {
 public:
@@ -29,7 +37,7 @@ public:
       : fFiles(std::move(files)),
         fSampleLabel(sampleLabel),
         fOptions(options),
-        fParallel(options.fParallel != 0 ? options.fParallel : std::max(1u, std::thread::hardware_concurrency())),
+        fParallel(options.fParallel != 0 ? options.fParallel : Processors()),
         fResults(fFiles.size()),
         fLogs(fFiles.size()) {}
 

@@ -39,6 +39,16 @@ std::vector<pid_t> Children(pid_t process) {
   return children;
 }
 
+// The name of a program may contain blanks and brackets.
+std::optional<TProcessState> StateOf(pid_t process) {
+  std::ifstream stream("/proc/" + std::to_string(process) + "/stat");
+  std::string stat;
+  std::getline(stream, stat);
+  std::size_t const begin = stat.find('('), end = stat.rfind(") ");
+  if (begin == stat.npos || end == stat.npos || end + 2 >= stat.size()) return std::nullopt;
+  return TProcessState{stat.substr(begin + 1, end - begin - 1), stat[end + 2]};
+}
+
 TOrphans::TOrphans() : fEarlier(HasChildren() ? Children() : std::vector<pid_t>()) {
   ::prctl(PR_GET_CHILD_SUBREAPER, &fWasReaper);
   ::prctl(PR_SET_CHILD_SUBREAPER, 1);

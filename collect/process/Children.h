@@ -4,6 +4,8 @@
 #include <sys/types.h>
 #include <unistd.h>
 
+#include <optional>
+#include <string>
 #include <vector>
 
 namespace NQRVZEP20 {
@@ -11,6 +13,17 @@ namespace NQRVZEP20 {
 // The children of a process, by default this one, including zombies. Empty when it does not exist, and on a kernel that was built
 // without CONFIG_PROC_CHILDREN.
 std::vector<pid_t> Children(pid_t process = ::getpid());
+
+struct TProcessState {
+  std::string fName;  // of its program
+  char fLetter;  // as in proc(5): 'Z' has ended, and its parent has not waited for it; 'T' is stopped; 't' is stopped by a tracer
+
+  bool IsZombie() const { return fLetter == 'Z'; }
+  bool IsStopped() const { return fLetter == 'T' || fLetter == 't'; }
+};
+
+// None when the process does not exist.
+std::optional<TProcessState> StateOf(pid_t process);
 
 // Becomes the parent of processes whose parent has ended, as init usually does, and ends them. The constructor and the destructor
 // change this for the whole process (PR_SET_CHILD_SUBREAPER). Use it while no other part of the program starts processes.

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/process/TPlugInProcess.h"
 
+#include "collect/process/Children.h"
 #include "collect/process/LogLines.h"
 #include "collect/process/PlugInChild.h"
 #include "collect/process/SignalText.h"
@@ -21,11 +22,12 @@ namespace NQRVZEP20 {
 
 namespace {
 
-constexpr std::size_t kMostWords = 4096;             // kept of either end
-constexpr std::size_t kMostLog = 16u * 1024 * 1024;  // the last line is kept of a longer log, too
-constexpr std::chrono::seconds kGrace(5);            // for a process whose pipe is closed to end by itself
-constexpr std::chrono::seconds kTimeToEnd(10);       // for a supervisor to end everything
-constexpr int kMostDrains = 64;                      // mebibytes that a pipe may still hold at the end
+constexpr std::size_t kMostWords = 4096;                // kept of either end
+constexpr std::size_t kMostLog = 16u * 1024 * 1024;     // the last line is kept of a longer log, too
+constexpr std::chrono::seconds kGrace(5);               // for a process whose pipe is closed to end by itself
+constexpr std::chrono::seconds kTimeToEnd(10);          // for a supervisor to end everything
+constexpr std::chrono::milliseconds kTimeToReact(200);  // for a supervisor, before its state is looked at
+constexpr int kMostDrains = 64;                         // mebibytes that a pipe may still hold at the end
 
 // Reads what has arrived, up to a mebibyte, and passes it on. Closes the descriptor at the end of the pipe.
 template <class TTake>
@@ -152,7 +154,7 @@ void TPlugInProcess::ReadAnswer() {
         return End(EEnding::kBadAnswer);
     }
   });
-  if (!fAnswerEnd && !fGiveUpAt) fGiveUpAt = std::min(TClock::now() + kGrace, NextDeadline());
+  if (!fAnswerEnd && !fGiveUpAt) WaitUntil(std::min(TClock::now() + kGrace, NextDeadline()));
 }
 
 // Once.
@@ -189,10 +191,27 @@ void TPlugInProcess::End(EEnding ending) {
   if (fEnding != EEnding::kNone) return;
   fEnding = ending;
   fControl.reset();
-  fGiveUpAt = TClock::now() + kTimeToEnd;
+  WaitUntil(TClock::now() + kTimeToEnd);
+}
+
+// The supervisor has a moment to react.
+void TPlugInProcess::WaitUntil(TClock::time_point time) {
+  fGiveUpAt = time;
+  fLookAt = TClock::now() + kTimeToReact;
+}
+
+// Nobody else stops it: it has a session of its own.
+bool TPlugInProcess::IsSupervisorStopped() const {
+  if (!fLookAt || TClock::now() < *fLookAt) return false;
+  auto const state = StateOf(fSupervisor);
+  return state && state->IsStopped();
 }
 
 void TPlugInProcess::CheckDeadlines() {
+  if (IsSupervisorStopped()) {
+    fHasStoppedSupervisor = true;
+    return Complete();
+  }
   if (TClock::now() < NextDeadline()) return;
   if (fEnding == EEnding::kNone) return End(fGiveUpAt ? EEnding::kClosed : EEnding::kTimeUp);
   Complete();  // the supervisor is stopped, or a process waits for a device and cannot be ended
@@ -204,21 +223,27 @@ void TPlugInProcess::Complete() {
   ReadWords();
   ReadLog();
   bool const exceedsLimit = fEnding == EEnding::kTimeUp || fEnding == EEnding::kTooLong;
-  if (fEnding != EEnding::kDone) fAnswer.Fail(WhyDead(), exceedsLimit);
+  if (fEnding != EEnding::kDone || fHasStoppedSupervisor) fAnswer.Fail(WhyDead(), exceedsLimit);
   fResult = fAnswer.Finish(fWords.Get());
   fHasEnded = true;
 }
 
-// It has given its word, or never will.
+// It has given its word, or never will. If the plug-in traces it, it cannot be waited for before the plug-in has ended: both are
+// then waited for as orphans (Children.h).
 void TPlugInProcess::EndSupervisor() {
   if (fSupervisor <= 0) return;
   ::kill(fSupervisor, SIGKILL);
-  while (::waitpid(fSupervisor, nullptr, 0) < 0 && errno == EINTR) continue;
+  int const options = fHasStoppedSupervisor ? WNOHANG : 0;
+  while (::waitpid(fSupervisor, nullptr, options) < 0 && errno == EINTR) continue;
   fSupervisor = -1;
 }
 
 std::string TPlugInProcess::WhyDead() const {
-  if (fEnding == EEnding::kTimeUp) return "it exceeded the time limit of " + std::to_string(fLimits.fTimeoutSeconds) + " s";
+  std::string const stopped = "has stopped its supervisor process";
+  if (fEnding == EEnding::kTimeUp)
+    return "it exceeded the time limit of " + std::to_string(fLimits.fTimeoutSeconds) + " s" +
+           (fHasStoppedSupervisor ? ", and " + stopped : "");
+  if (fHasStoppedSupervisor) return "it " + stopped;
   if (fEnding == EEnding::kTooLong) return "its result exceeds " + std::to_string(fLimits.fAnswerBytes) + " bytes";
   if (fEnding == EEnding::kBadAnswer) return "its result is invalid: " + fAnswer.WhyBad();
   if (fAnswer.Ending()) return *fAnswer.Ending();

@@ -59,6 +59,9 @@ public:
 private:
   enum class EEnding { kNone, kDone, kTimeUp, kTooLong, kBadAnswer, kClosed };
 
+  void WaitUntil(TClock::time_point time);
+  bool IsSupervisorStopped() const;
+
   void Start(TApartLimits const& limits, bool measures);
   void ReadAnswer();
   void ReadWords();
@@ -84,7 +87,8 @@ private:
 
   std::optional<TClock::time_point> fDeadline;  // of the load or the fill
   std::optional<TClock::time_point> fGiveUpAt;  // when the supervisor or the process is waited for no longer
-  bool fIsInFillTime = false, fHasEnded = false;
+  std::optional<TClock::time_point> fLookAt;    // from when on a supervisor that is stopped is noticed
+  bool fIsInFillTime = false, fHasEnded = false, fHasStoppedSupervisor = false;
   EEnding fEnding = EEnding::kNone;
   std::optional<TVerdict> fVerdict;
 };

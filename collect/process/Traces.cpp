@@ -7,8 +7,6 @@
 #include <unistd.h>
 
 #include <filesystem>
-#include <fstream>
-#include <optional>
 #include <vector>
 
 namespace NQRVZEP20 {
@@ -24,23 +22,9 @@ std::vector<fs::path> EntriesOf(fs::path const& directory) {
   return entries;
 }
 
-struct TProcessState {
-  std::string fName;
-  bool fIsZombie = false;  // it has ended, and its parent has not waited for it
-};
-
-// None when the process does not exist. The name of a program may contain blanks and brackets.
-std::optional<TProcessState> StateOf(pid_t process) {
-  std::ifstream stream("/proc/" + std::to_string(process) + "/stat");
-  std::string stat;
-  std::getline(stream, stat);
-  std::size_t const begin = stat.find('('), end = stat.rfind(") ");
-  if (begin == stat.npos || end == stat.npos || end + 2 >= stat.size()) return std::nullopt;
-  return TProcessState{stat.substr(begin + 1, end - begin - 1), stat[end + 2] == 'Z'};
-}
-
 std::string TextOf(pid_t process, TProcessState const& state) {
-  return std::to_string(process) + " (" + state.fName + ")" + (state.fIsZombie ? ", which has ended and was not waited for" : "");
+  return std::to_string(process) + " (" + state.fName + ")" +
+         (state.IsZombie() ? ", which has ended and was not waited for" : "");
 }
 
 void Add(std::vector<std::string>& traces, std::string const& trace) {
@@ -69,7 +53,7 @@ TTraces TracesSince(std::map<int, std::string> const& before) {
     if (auto const state = StateOf(child)) Add(traces.fProcesses, TextOf(child, *state));
   for (pid_t const orphan : Children(::getppid())) {
     auto const state = StateOf(orphan);
-    if (orphan != ::getpid() && state && !state->fIsZombie) Add(traces.fProcesses, TextOf(orphan, *state));
+    if (orphan != ::getpid() && state && !state->IsZombie()) Add(traces.fProcesses, TextOf(orphan, *state));
   }
   return traces;
 }

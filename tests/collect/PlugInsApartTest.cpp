@@ -173,10 +173,13 @@ TEST_F(PlugInsApartMisdeedTest, NoProcessOutlivesTheOwner) {
 }
 
 TEST_F(PlugInsApartMisdeedTest, APlugInThatHarmsItsSupervisorLeavesNoProcess) {
-  Add({"KillsItsSupervisor", "StopsItsSupervisor", "Healthy"});
+  Add({"KillsItsSupervisor", "StopsItsSupervisor", "StopsItsSupervisorAndReturns", "Healthy"});
   TLines const lines = List("--timeout 6 --parallel 8 --state");
   EXPECT_THAT(lines, Contains(InFill("KillsItsSupervisor", "its supervisor process died")));
-  EXPECT_THAT(lines, Contains(InFill("StopsItsSupervisor", "it exceeded the time limit of 6 s")));
+  EXPECT_THAT(
+      lines, Contains(InFill("StopsItsSupervisor", "it exceeded the time limit of 6 s, and has stopped its supervisor process")));
+  EXPECT_THAT(lines, Contains(InLoad("StopsItsSupervisorAndReturns", "it has stopped its supervisor process", "fill")));
+  EXPECT_THAT(lines, Contains(Filled("StopsItsSupervisorAndReturns")));
   EXPECT_THAT(lines, Contains(Filled("Healthy")));
   EXPECT_THAT(lines, Contains("children left: 0"));
   ExpectNoProcess("KillsItsSupervisor");

@@ -24,12 +24,16 @@
 #include <unistd.h>
 #include <boost/make_shared.hpp>
 
+#include <algorithm>
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <exception>
+#include <filesystem>
 #include <fstream>
 #include <iostream>
+#include <iterator>
 #include <map>
 #include <new>
 #include <stdexcept>
@@ -106,6 +110,52 @@ void HarmSupervisor(int signal) {
   ::kill(::getppid(), signal);
   HangHere();
 }
+
+void TraceSupervisor() {
+  StartDaemon(OwnName());
+  if (::ptrace(PTRACE_ATTACH, ::getppid(), nullptr, nullptr) != 0) throw std::runtime_error("it may not trace its supervisor");
+  HangHere();
+}
+
+// ---- The end of the process ----
+
+// An exception leaves a destructor, which is declared not to throw.
+struct TThrowsAtItsEnd {
+  ~TThrowsAtItsEnd() { ThrowHere("at the end"); }
+};
+
+[[noreturn]] void TerminateWith(std::terminate_handler handler) {
+  std::set_terminate(handler);
+  std::terminate();
+}
+
+void ExitWithThrowingStatic() {
+  static TThrowsAtItsEnd const object;
+  std::exit(3);
+}
+
+void LeaveThrowingStatic() { static TThrowsAtItsEnd const object; }
+
+// ---- Plug-ins that count how many of them work at the same time ----
+
+std::size_t CountRunning() {
+  auto const files = std::filesystem::directory_iterator(FileOf("running"));
+  return static_cast<std::size_t>(std::distance(begin(files), end(files)));
+}
+
+// Waits until as many as ZEP_OVERLAPS work, for at most ten seconds, and then for more.
+void CountOverlaps() {
+  std::string const own = FileOf("running/" + OwnName());
+  std::ofstream(own) << "";
+  std::size_t const expected = std::stoul(std::getenv("ZEP_OVERLAPS"));
+  std::size_t most = CountRunning();
+  for (int tries = 0; tries < 1000 && most < expected; ++tries, ::usleep(10'000)) most = std::max(most, CountRunning());
+  for (int tries = 0; tries < 50; ++tries, ::usleep(10'000)) most = std::max(most, CountRunning());
+  std::ofstream(FileOf("most-" + OwnName())) << most;
+  std::filesystem::remove(own);
+}
+
+// ---- Messages ----
 
 // The pipe with the highest number.
 int AnswerPipe() {
@@ -206,6 +256,21 @@ public:
   }
 };
 
+class TThrowingInstance : public TMemoryInstance {
+public:
+  using TMemoryInstance::TMemoryInstance;
+  ~TThrowingInstance() override { ThrowHere("an instance at its end"); }
+};
+
+class TClassOfThrowing : public TMemoryClass {
+public:
+  using TMemoryClass::TMemoryClass;
+  void EnumerateInstances(boost::function<bool(boost::shared_ptr<ICIMInstance>)> callback, TCIMContext const&) const override {
+    auto const self = boost::const_pointer_cast<TMemoryClass>(boost::static_pointer_cast<TMemoryClass const>(shared_from_this()));
+    callback(boost::make_shared<TThrowingInstance>(self, boost::make_shared<TMemoryLayout>()));
+  }
+};
+
 template <class TClass>
 boost::shared_ptr<TMemoryNamespace> NamespaceWith(std::size_t textLength) {
   auto const ns = boost::make_shared<TOwnNamespace>("root/own");
@@ -275,6 +340,18 @@ std::map<std::string, TMisdeed> const kWhileFilling = {
     {"Reads", [] { std::cout << "read " << std::cin.get() << std::endl; }},
     {"KillsItsSupervisor", [] { HarmSupervisor(SIGKILL); }},
     {"StopsItsSupervisor", [] { HarmSupervisor(SIGSTOP); }},
+    {"StopsItsSupervisorAndReturns", [] { ::kill(::getppid(), SIGSTOP); }},
+    {"TracesItsSupervisor", TraceSupervisor},
+    {"TerminatesAndExits", [] { TerminateWith([] { std::exit(5); }); }},
+    {"TerminatesAndReturns", [] { TerminateWith([] {}); }},
+    {"TerminatesAndHangs", [] { TerminateWith([] { HangHere(); }); }},
+    {"DestructorThrows", [] { TThrowsAtItsEnd const object; }},
+    {"ExitsWithThrowingStatic", ExitWithThrowingStatic},
+    {"LeavesThrowingStatic", LeaveThrowingStatic},
+    {"OverlapsA", CountOverlaps},
+    {"OverlapsB", CountOverlaps},
+    {"OverlapsC", CountOverlaps},
+    {"OverlapsD", CountOverlaps},
     {"SaysDone", [] { SendMessage(EMessage::kDone, ""), HangHere(); }},
     {"SaysLoaded", [] { SayLoadedForEver(); }},
     {"PrintsItsState", PrintState},
@@ -299,6 +376,9 @@ void Fill(TMemoryNamespace& ns) {
 class TProvider : public TMemoryProvider {
 public:
   using TMemoryProvider::TMemoryProvider;
+  ~TProvider() override {
+    if (OwnName() == "ProviderThrowsAtItsEnd") ThrowHere("a provider at its end");
+  }
   std::string const& GetName(TCIMContext const& context) const override {
     if (OwnName() == "RegistrationThrows") throw std::runtime_error("it has no name");
     if (OwnName() == "RegistrationHangs") HangHere();
@@ -310,6 +390,7 @@ public:
   boost::shared_ptr<ICIMNamespace> GetNamespace(TCIMContext const& context) override {
     if (OwnName() == "AnswersForever") return NamespaceWith<TEndlessClass>(1024 * 1024);
     if (OwnName() == "AnswersLate") return TMemoryProvider::GetNamespace(context), NamespaceWith<TMemoryClass>(32 * 1024 * 1024);
+    if (OwnName() == "InstanceThrowsAtItsEnd") return NamespaceWith<TClassOfThrowing>(0);
     if (OwnName() == "AnswersBroken") return NamespaceWith<TBrokenClass>(0);
     if (OwnName() == "HasNoNamespace") return {};
     if (OwnName() == "LeaksAndThrows") LeakAndThrow();  // here, where no namespace is freed

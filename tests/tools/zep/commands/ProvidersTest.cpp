@@ -6,10 +6,13 @@
 
 #include <gmock/gmock.h>
 #include <pty.h>
+#include <sched.h>
 #include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <chrono>
 #include <csignal>
 #include <regex>
 
@@ -114,6 +117,11 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
       {"ExitsAtOnce", "fill", "it exited with status 7", nullptr},
       {"Kills", "fill", "it was killed by SIGTERM (Terminated)", nullptr},
       {"KillsItsSupervisor", "fill", "its supervisor process died", nullptr},
+      {"TerminatesAndExits", "fill", "it exited with status 5", nullptr},
+      {"TerminatesAndReturns", "fill", "it was killed by SIGABRT (Aborted)", nullptr},
+      {"DestructorThrows", "fill", "at the end", nullptr},
+      {"ExitsWithThrowingStatic", "fill", "at the end", nullptr},
+      {"InstanceThrowsAtItsEnd", "fill", "an instance at its end", nullptr},
       {"Executes", "fill", "it exited with status 9", nullptr},
       {"Closes", "fill", "it closed the descriptor for its result", nullptr},
       {"LoadThrows", "static construction", "no disk today", nullptr},
@@ -123,7 +131,10 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
       {"RegistersNull", "registration", "kZEPStatusFail (it registers an empty pointer)", nullptr},
   };
   for (TRow const& row : rows) Add({row.fName});
-  Add({"ChangesDirectory", "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken"});
+  std::vector<std::string> const harmless = {
+      "ChangesDirectory",      "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken", "LeavesThrowingStatic",
+      "ProviderThrowsAtItsEnd"};
+  Add(harmless);
   TRun const run = Run({"report", "--json"});
   EXPECT_EQ(run.fStatus, 2);
   auto const document = JsonOf(run);
@@ -136,8 +147,7 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
     EXPECT_EQ(failure["lastLogLine"], row.fLastLogLine != nullptr ? nlohmann::json(row.fLastLogLine) : nlohmann::json());
     EXPECT_THAT(document["reason"].get<std::string>(), HasSubstr("lib" + std::string(row.fName) + ".nsp.so"));
   }
-  for (char const* name : {"ChangesDirectory", "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken"})
-    EXPECT_TRUE(FailureIn(document, name)["error"].is_null()) << name;
+  for (std::string const& name : harmless) EXPECT_TRUE(FailureIn(document, name)["error"].is_null()) << name;
   EXPECT_EQ(FailureIn(document, "AnswersBroken")["namespace"], "root/own");
   EXPECT_THAT(document["instanceFailures"],
               Contains(nlohmann::json{{"provider", "AnswersBroken"}, {"error", "kZEPStatusTypeMismatch"}}));
@@ -242,6 +252,60 @@ TEST_F(ProvidersTest, PlugInsThatHangOrStopAreEndedAtTheTimeLimit) {
   EXPECT_EQ(FailureIn(document, "RegistrationHangs")["stage"], "registration");
   ExpectNoProcess("Hangs");
   ExpectNoProcess("HangsBlocked");
+}
+
+// The processors that this process, and hence zep, may use; the old ones again at the end.
+class TProcessors {
+public:
+  explicit TProcessors(std::size_t most) {
+    ::sched_getaffinity(0, sizeof fBefore, &fBefore);
+    cpu_set_t some;
+    CPU_ZERO(&some);
+    for (std::size_t cpu = 0; cpu < CPU_SETSIZE && fCount < most; ++cpu)
+      if (CPU_ISSET(cpu, &fBefore)) CPU_SET(cpu, &some), ++fCount;
+    ::sched_setaffinity(0, sizeof some, &some);
+  }
+  ~TProcessors() { ::sched_setaffinity(0, sizeof fBefore, &fBefore); }
+  std::size_t Count() const { return fCount; }
+
+private:
+  cpu_set_t fBefore;
+  std::size_t fCount = 0;
+};
+
+// zep is back soon after the limit: nobody waits for a supervisor that is stopped.
+TEST_F(ProvidersTest, APlugInThatStopsItsSupervisorIsNamedSoonAfterItsLimit) {
+  NEEDS(::geteuid() == 0, "root, who may trace every process");
+  fZep.Remove("libHost.nsp.so");
+  Add({"StopsItsSupervisor", "TracesItsSupervisor", "TerminatesAndHangs", "StopsItsSupervisorAndReturns"});
+  TProcessors const processors(2);
+  int const turns = processors.Count() == 2 ? 2 : 3;  // of three plug-ins that take the time to the limit
+  auto const begin = std::chrono::steady_clock::now();
+  auto const document = JsonOf(Run({"report", "--json", "--plugin-timeout", "6"}));
+  EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(6 * turns + 8));
+  std::string const limit = "it exceeded the time limit of 6 s";
+  EXPECT_EQ(FailureIn(document, "StopsItsSupervisor")["error"], limit + ", and has stopped its supervisor process");
+  EXPECT_EQ(FailureIn(document, "TracesItsSupervisor")["error"], limit + ", and has stopped its supervisor process");
+  EXPECT_EQ(FailureIn(document, "TerminatesAndHangs")["error"], limit);
+  EXPECT_EQ(FailureIn(document, "StopsItsSupervisorAndReturns")["error"], "it has stopped its supervisor process");
+  ExpectNoProcess("StopsItsSupervisor");
+  ExpectNoProcess("TracesItsSupervisor");
+}
+
+TEST_F(ProvidersTest, AsManyPlugInsWorkSideBySideAsThereAreProcessors) {
+  std::vector<std::string> const names = {"OverlapsA", "OverlapsB", "OverlapsC", "OverlapsD"};
+  Add(names);
+  fZep.Remove("libHost.nsp.so");
+  fs::create_directory(fZep.Path("running"));
+  for (std::size_t const most : {1, 2}) {
+    TProcessors const processors(most);
+    TEnvironmentGuard const expected("ZEP_OVERLAPS", std::to_string(processors.Count()).c_str());
+    EXPECT_EQ(Run({"classes"}).fStatus, 0);
+    std::size_t overlaps = 0;
+    for (std::string const& name : names)
+      overlaps = std::max<std::size_t>(overlaps, std::stoul(ReadFile(fZep.Path("most-" + name))));
+    EXPECT_EQ(overlaps, processors.Count());
+  }
 }
 
 TEST_F(ProvidersTest, AClosedDescriptorIsNamedEvenIfTheTimeLimitIsShort) {
