@@ -8,10 +8,11 @@ namespace NQRVZEP20 {
 // The data of a TCIMValue that is a string: bytes in any encoding.
 class ZEP_EXPORT TCIMStringValueImpl : public TCIMValueImpl {
 public:
-  TCIMStringValueImpl(std::string const& text);
-  TCIMStringValueImpl(char const* text);
-  TCIMStringValueImpl(TCIMStringValueImpl const& other);
-  ~TCIMStringValueImpl() override;
+  TCIMStringValueImpl(std::string const& text) : fText(text) {}
+  TCIMStringValueImpl(char const* text) : fText(text) {}
+  TCIMStringValueImpl(TCIMStringValueImpl const& other) = default;
+  TCIMStringValueImpl(TCIMStringValueImpl&& other) noexcept = default;
+  ~TCIMStringValueImpl() override = default;
 
   operator std::string() const override;
 
@@ -23,7 +24,7 @@ public:
   bool operator<(TCIMValue const& other) const override;
 
 private:
-  std::string const fText;
+  std::string fText;
 };
 
 }  // namespace NQRVZEP20

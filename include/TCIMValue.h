@@ -17,7 +17,6 @@ namespace NQRVZEP20 {
 
 class ICIMClass;
 class ICIMNamespace;
-class TCIMNumericValueImpl;
 class TCIMReference;
 class TCIMValueImpl;
 
@@ -107,7 +106,9 @@ public:
 
   TCIMValue(TCIMValue const& other);
   TCIMValue(TCIMValue&& other) noexcept;  // leaves `other` in the default state
-  ~TCIMValue();
+  ~TCIMValue() {
+    if (OwnsMemory()) DestroyData();
+  }
 
   // ---- Assignment ----
 
@@ -155,7 +156,7 @@ public:
 
   // ---- Queries ----
 
-  bool IsNull() const noexcept { return !fData; }
+  bool IsNull() const noexcept { return fData == nullptr; }
   TCIMType GetType() const noexcept { return fType; }
   bool IsArray() const noexcept { return (fType & TCIMType::kCIMTypeArrayFlag) != 0; }
   bool IsReference() const noexcept { return fType == TCIMType::kCIMTypeReference; }    // false for an array of references
@@ -204,40 +205,26 @@ public:
 private:
   friend class TCIMValueImpl;
 
-  // Owns the data of one value. A number, the smallest and most frequent kind, is stored inside the value and needs no
-  // allocation; every other kind is allocated on the heap.
-  class TData {
-  public:
-    TData() noexcept : fImpl(nullptr) {}
-    explicit TData(TCIMNumericValueImpl const& number) noexcept;
-    explicit TData(std::unique_ptr<TCIMValueImpl> data) noexcept;
-    static TData CopyOf(TCIMType type, TData const& other);  // `type`: the type of the value that holds `other`
-    TData(TData&& other) noexcept;
-    TData& operator=(TData&& other) noexcept;
-    ~TData();
+  template <class TKind, class TSource>
+  TCIMValueImpl* NewData(TSource const& source);
+  TCIMValueImpl* NewCopyOf(TCIMValueImpl const& data);
+  bool IsInPlace() const noexcept;
 
-    explicit operator bool() const noexcept { return fImpl != nullptr; }
-    TCIMValueImpl const& operator*() const noexcept { return *fImpl; }
-    TCIMValueImpl const* operator->() const noexcept { return fImpl; }
-
-  private:
-    bool IsInPlace() const noexcept;
-    void Take(TData& other) noexcept;
-
-    TCIMValueImpl* fImpl;  // null; or points to the number in fPlace; or owns a heap object
-    alignas(void*) unsigned char fPlace[24];
-  };
-
-  TCIMValue(TCIMType type, TData data) noexcept;
-
+  bool IsNumber() const noexcept { return fType >= TCIMType::kCIMTypeBoolean && fType <= TCIMType::kCIMTypeReal64; }
+  bool OwnsMemory() const noexcept { return fData != nullptr && !IsNumber(); }  // else it is destroyed without a call
+  void DestroyData() noexcept;
+  void TakeData(TCIMValue&& other) noexcept;
+  void TakeFrom(TCIMValue&& other) noexcept;
   TCIMValueImpl const& DataAs(TCIMType required) const;
-  void SetData(TCIMType type, TData data) noexcept;
-  void TakeFrom(TCIMValue& other) noexcept;
 
   TCIMType fType;
-  TData fData;  // empty means the value is NULL; never shared
+  unsigned int fMaxArraySize = 0;
   boost::shared_ptr<ICIMClass> fReferencedClass;
-  unsigned int fMaxArraySize;
+
+  // The data of one value, never shared. Numbers and strings, the most frequent kinds, are stored inside the value; every other
+  // kind is allocated on the heap.
+  TCIMValueImpl* fData = nullptr;  // null: the value is NULL; or points to the number or string in fPlace; or owns a heap object
+  alignas(void*) unsigned char fPlace[40];
 };
 
 // Writes the name that TCIMType::ToString returns; its exceptions pass through.

@@ -47,6 +47,7 @@ public:
 protected:
   TCIMValueImpl() = default;
   TCIMValueImpl(TCIMValueImpl const&) = default;
+  TCIMValueImpl(TCIMValueImpl&&) = default;
   TCIMValueImpl& operator=(TCIMValueImpl const&) = delete;
 
   // The data of `value`. The caller has checked that the tag of `value` belongs to TKind. Throws kZEPStatusValueIsNULL for a
@@ -57,7 +58,11 @@ protected:
   }
 
 private:
-  static TCIMValueImpl const& DataOf(TCIMValue const& value);
+  static TCIMValueImpl const& DataOf(TCIMValue const& value) {
+    if (value.IsNull()) RefuseNull();
+    return *value.fData;
+  }
+  [[noreturn]] static void RefuseNull();
 };
 
 }  // namespace NQRVZEP20

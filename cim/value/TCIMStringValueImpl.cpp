@@ -3,11 +3,6 @@
 
 namespace NQRVZEP20 {
 
-TCIMStringValueImpl::TCIMStringValueImpl(std::string const& text) : fText(text) {}
-TCIMStringValueImpl::TCIMStringValueImpl(char const* text) : fText(text) {}
-TCIMStringValueImpl::TCIMStringValueImpl(TCIMStringValueImpl const& other) = default;
-TCIMStringValueImpl::~TCIMStringValueImpl() = default;
-
 TCIMStringValueImpl::operator std::string() const { return fText; }
 
 std::string TCIMStringValueImpl::ToString(unsigned char) const { return fText; }

@@ -10,6 +10,7 @@
 #include <ostream>
 #include <string_view>
 #include <type_traits>
+#include <utility>
 
 namespace NQRVZEP20 {
 
@@ -57,71 +58,85 @@ std::string TCIMValue::TCIMType::ToString() const {
 
 std::ostream& operator<<(std::ostream& stream, TCIMValue::TCIMType const& type) { return stream << type.ToString(); }
 
-// ---- The owner of the data ----
+// ---- The data ----
 
-TCIMValue::TData::TData(TCIMNumericValueImpl const& number) noexcept : fImpl(new (fPlace) TCIMNumericValueImpl(number)) {
-  static_assert(sizeof number <= sizeof fPlace && alignof(TCIMNumericValueImpl) <= alignof(void*));
+namespace {
+
+// The kinds that are stored inside a value.
+template <class TKind>
+constexpr bool kIsInPlace = std::is_same_v<TKind, TCIMNumericValueImpl> || std::is_same_v<TKind, TCIMStringValueImpl>;
+
+}  // namespace
+
+// The data of a value that is NULL until now.
+template <class TKind, class TSource>
+TCIMValueImpl* TCIMValue::NewData(TSource const& source) {
+  static_assert(!kIsInPlace<TKind> || (sizeof(TKind) <= sizeof fPlace && alignof(TKind) <= alignof(void*)));
+  if constexpr (kIsInPlace<TKind>)
+    return new (fPlace) TKind(source);
+  else
+    return std::make_unique<TKind>(source).release();
 }
 
-TCIMValue::TData::TData(std::unique_ptr<TCIMValueImpl> data) noexcept : fImpl(data.release()) {}
-
-TCIMValue::TData TCIMValue::TData::CopyOf(TCIMType type, TData const& other) {
-  if (!other) return TData();
-  if (type & TType::kCIMTypeArrayFlag)
-    return TData(std::make_unique<TCIMArrayValueImpl>(static_cast<TCIMArrayValueImpl const&>(*other)));
-  return OnScalarType(type, [&](auto scalar) {
+// `data`: of a value of this type.
+TCIMValueImpl* TCIMValue::NewCopyOf(TCIMValueImpl const& data) {
+  if (IsNumber()) return NewData<TCIMNumericValueImpl>(static_cast<TCIMNumericValueImpl const&>(data));
+  if (IsArray()) return NewData<TCIMArrayValueImpl>(static_cast<TCIMArrayValueImpl const&>(data));
+  return OnScalarType(fType, [&](auto scalar) {
     using TKind = typename decltype(scalar)::TKind;
-    auto const& data = static_cast<TKind const&>(*other);
-    if constexpr (std::is_same_v<TKind, TCIMNumericValueImpl>)
-      return TData(data);
-    else
-      return TData(std::make_unique<TKind>(data));
+    return NewData<TKind>(static_cast<TKind const&>(data));
   });
 }
 
-TCIMValue::TData::TData(TData&& other) noexcept { Take(other); }
+bool TCIMValue::IsInPlace() const noexcept { return static_cast<void const*>(fData) == fPlace; }
 
-TCIMValue::TData& TCIMValue::TData::operator=(TData&& other) noexcept {
-  TData const old(std::move(*this));  // destroyed last, because `other` may be part of it
-  Take(other);
-  return *this;
+// A number needs no destruction.
+void TCIMValue::DestroyData() noexcept {
+  if (!IsInPlace())
+    delete fData;
+  else if (fType == TType::kCIMTypeString)
+    static_cast<TCIMStringValueImpl*>(fData)->TCIMStringValueImpl::~TCIMStringValueImpl();
+  fData = nullptr;
 }
 
-TCIMValue::TData::~TData() {
-  if (!IsInPlace()) delete fImpl;  // a number needs no destruction
-}
-
-bool TCIMValue::TData::IsInPlace() const noexcept { return static_cast<void const*>(fImpl) == fPlace; }
-
-void TCIMValue::TData::Take(TData& other) noexcept {
-  fImpl = other.IsInPlace() ? new (fPlace) TCIMNumericValueImpl(static_cast<TCIMNumericValueImpl&>(*other.fImpl)) : other.fImpl;
-  other.fImpl = nullptr;
+// Takes over the tag and the data of another value, which must not be part of this one's data, and leaves it NULL with tag 0.
+void TCIMValue::TakeData(TCIMValue&& other) noexcept {
+  DestroyData();
+  fType = other.fType;
+  if (!other.IsInPlace())
+    fData = std::exchange(other.fData, nullptr);
+  else if (fType == TType::kCIMTypeString)
+    fData = new (fPlace) TCIMStringValueImpl(std::move(static_cast<TCIMStringValueImpl&>(*other.fData)));
+  else
+    fData = new (fPlace) TCIMNumericValueImpl(static_cast<TCIMNumericValueImpl&>(*other.fData));
+  other.DestroyData();
+  other.fType = TType::kCIMTypeInvalid;
 }
 
 // ---- Construction ----
 
-TCIMValue::TCIMValue() noexcept : fType(TType::kCIMTypeInvalid), fMaxArraySize(0) {}
+TCIMValue::TCIMValue() noexcept : fType(TType::kCIMTypeInvalid) {}
 
 TCIMValue::TCIMValue(TCIMType type, unsigned int arraySize)
     : fType(arraySize != 0 ? ArrayOf(type) : type), fMaxArraySize(arraySize) {}
 
-TCIMValue::TCIMValue(TCIMType type, TData data) noexcept : fType(type), fData(std::move(data)), fMaxArraySize(0) {}
+TCIMValue::TCIMValue(bool value) : fType(TType::kCIMTypeBoolean), fData(NewData<TCIMNumericValueImpl>(value)) {}
+TCIMValue::TCIMValue(unsigned char value) : fType(TType::kCIMTypeUint8), fData(NewData<TCIMNumericValueImpl>(value)) {}
+TCIMValue::TCIMValue(signed char value) : fType(TType::kCIMTypeSint8), fData(NewData<TCIMNumericValueImpl>(value)) {}
+TCIMValue::TCIMValue(unsigned short value) : fType(TType::kCIMTypeUint16), fData(NewData<TCIMNumericValueImpl>(value)) {}
+TCIMValue::TCIMValue(short value) : fType(TType::kCIMTypeSint16), fData(NewData<TCIMNumericValueImpl>(value)) {}
+TCIMValue::TCIMValue(unsigned int value) : fType(TType::kCIMTypeUint32), fData(NewData<TCIMNumericValueImpl>(value)) {}
+TCIMValue::TCIMValue(int value) : fType(TType::kCIMTypeSint32), fData(NewData<TCIMNumericValueImpl>(value)) {}
+TCIMValue::TCIMValue(unsigned long value) : fType(TType::kCIMTypeUint64), fData(NewData<TCIMNumericValueImpl>(value)) {}
+TCIMValue::TCIMValue(long value) : fType(TType::kCIMTypeSint64), fData(NewData<TCIMNumericValueImpl>(value)) {}
+TCIMValue::TCIMValue(float value) : fType(TType::kCIMTypeReal32), fData(NewData<TCIMNumericValueImpl>(value)) {}
+TCIMValue::TCIMValue(double value) : fType(TType::kCIMTypeReal64), fData(NewData<TCIMNumericValueImpl>(value)) {}
+TCIMValue::TCIMValue(TCIMChar16 const& value) : fType(TType::kCIMTypeChar16), fData(NewData<TCIMChar16ValueImpl>(value)) {}
+TCIMValue::TCIMValue(char const* value) : fType(TType::kCIMTypeString), fData(NewData<TCIMStringValueImpl>(value)) {}
+TCIMValue::TCIMValue(std::string const& value) : fType(TType::kCIMTypeString), fData(NewData<TCIMStringValueImpl>(value)) {}
 
-TCIMValue::TCIMValue(bool value) : TCIMValue(TType::kCIMTypeBoolean, TData(TCIMNumericValueImpl(value))) {}
-TCIMValue::TCIMValue(unsigned char value) : TCIMValue(TType::kCIMTypeUint8, TData(TCIMNumericValueImpl(value))) {}
-TCIMValue::TCIMValue(signed char value) : TCIMValue(TType::kCIMTypeSint8, TData(TCIMNumericValueImpl(value))) {}
-TCIMValue::TCIMValue(unsigned short value) : TCIMValue(TType::kCIMTypeUint16, TData(TCIMNumericValueImpl(value))) {}
-TCIMValue::TCIMValue(short value) : TCIMValue(TType::kCIMTypeSint16, TData(TCIMNumericValueImpl(value))) {}
-TCIMValue::TCIMValue(unsigned int value) : TCIMValue(TType::kCIMTypeUint32, TData(TCIMNumericValueImpl(value))) {}
-TCIMValue::TCIMValue(int value) : TCIMValue(TType::kCIMTypeSint32, TData(TCIMNumericValueImpl(value))) {}
-TCIMValue::TCIMValue(unsigned long value) : TCIMValue(TType::kCIMTypeUint64, TData(TCIMNumericValueImpl(value))) {}
-TCIMValue::TCIMValue(long value) : TCIMValue(TType::kCIMTypeSint64, TData(TCIMNumericValueImpl(value))) {}
-TCIMValue::TCIMValue(float value) : TCIMValue(TType::kCIMTypeReal32, TData(TCIMNumericValueImpl(value))) {}
-TCIMValue::TCIMValue(double value) : TCIMValue(TType::kCIMTypeReal64, TData(TCIMNumericValueImpl(value))) {}
-TCIMValue::TCIMValue(TCIMChar16 const& value) : TCIMValue() { Set(value); }
-TCIMValue::TCIMValue(char const* value) : TCIMValue() { Set(value); }
-TCIMValue::TCIMValue(std::string const& value) : TCIMValue() { Set(value); }
-TCIMValue::TCIMValue(TCIMDateTime const& value) : TCIMValue() { Set(value); }
+TCIMValue::TCIMValue(TCIMDateTime const& value) : fType(TType::kCIMTypeDateTime), fData(NewData<TCIMDateTimeValueImpl>(value)) {}
+
 TCIMValue::TCIMValue(TCIMReference& value) : TCIMValue() { Set(value); }
 
 TCIMValue::TCIMValue(TCIMType type, unsigned int maxArraySize, std::vector<TCIMValue> const& elements) : TCIMValue() {
@@ -138,95 +153,82 @@ TCIMValue::TCIMValue(TCIMType type, std::string& text, boost::shared_ptr<ICIMNam
       // The 8-bit types are read as 32-bit numbers and cut without a range check: "300" as uint8 is 44. Kept.
       using TRead = std::conditional_t<std::is_same_v<TStorage, unsigned char>, unsigned int,
                                        std::conditional_t<std::is_same_v<TStorage, signed char>, int, TStorage>>;
-      Set(static_cast<TStorage>(ReadNumber<TRead>(text)));
+      fType = type;
+      fData = NewData<TCIMNumericValueImpl>(static_cast<TStorage>(ReadNumber<TRead>(text)));
     } else {
       Set(static_cast<TStorage const&>(text));
     }
   });
 }
 
-TCIMValue::TCIMValue(TCIMValue const& other)
-    : fType(other.fType),
-      fData(TData::CopyOf(other.fType, other.fData)),
-      fMaxArraySize(other.IsArray() ? other.fMaxArraySize : 0) {
+TCIMValue::TCIMValue(TCIMValue const& other) : fType(other.fType), fMaxArraySize(other.IsArray() ? other.fMaxArraySize : 0) {
   if (IsReference()) fReferencedClass = other.fReferencedClass;
+  if (!other.IsNull()) fData = NewCopyOf(*other.fData);
 }
 
-TCIMValue::TCIMValue(TCIMValue&& other) noexcept : TCIMValue() { TakeFrom(other); }
-
-TCIMValue::~TCIMValue() = default;
+TCIMValue::TCIMValue(TCIMValue&& other) noexcept : TCIMValue() { TakeFrom(std::move(other)); }
 
 // ---- Assignment ----
 
-TCIMValue& TCIMValue::operator=(TCIMValue const& other) {
+TCIMValue& TCIMValue::operator=(TCIMValue const& other) {  // NOLINT(bugprone-unhandled-self-assignment): Set handles it
   Set(other);
   return *this;
 }
 
 TCIMValue& TCIMValue::operator=(TCIMValue&& other) {
   if (*this == other) return *this;
-  TCIMValue taken(std::move(other));  // `other` may be an element of this value, destroyed with the old data
-  TakeFrom(taken);
+  TakeFrom(TCIMValue(std::move(other)));  // `other` may be an element of this value, destroyed with the old data
   return *this;
 }
 
 void TCIMValue::Set(TCIMValue const& other) {
-  if (*this == other) return;
-  TCIMValue copy(other);
-  TakeFrom(copy);
+  if (!(*this == other)) TakeFrom(TCIMValue(other));
 }
 
 // Takes over the tag and the data, the maximum array size of an array and the referenced class of a reference. Leaves
 // `other`, which must not be part of this value's data, in the default state.
-void TCIMValue::TakeFrom(TCIMValue& other) noexcept {
-  fType = std::exchange(other.fType, TType::kCIMTypeInvalid);
-  fData = std::move(other.fData);
+void TCIMValue::TakeFrom(TCIMValue&& other) noexcept {
   unsigned int const maxArraySize = std::exchange(other.fMaxArraySize, 0);
   boost::shared_ptr<ICIMClass> referencedClass = std::move(other.fReferencedClass);
+  TakeData(std::move(other));
   if (IsArray()) fMaxArraySize = maxArraySize;
   if (IsReference()) fReferencedClass = std::move(referencedClass);
 }
 
 void TCIMValue::SetNullValue(TCIMType::ECIMType type, unsigned int arraySize) {
-  SetData(type, TData());
+  TakeData(TCIMValue(type, 0));
   if (IsArray()) fMaxArraySize = arraySize;
 }
 
-void TCIMValue::SetData(TCIMType type, TData data) noexcept {
-  fType = type;
-  fData = std::move(data);
-}
-
-void TCIMValue::Set(bool value) { SetData(TType::kCIMTypeBoolean, TData(TCIMNumericValueImpl(value))); }
-void TCIMValue::Set(unsigned char value) { SetData(TType::kCIMTypeUint8, TData(TCIMNumericValueImpl(value))); }
-void TCIMValue::Set(signed char value) { SetData(TType::kCIMTypeSint8, TData(TCIMNumericValueImpl(value))); }
-void TCIMValue::Set(unsigned short value) { SetData(TType::kCIMTypeUint16, TData(TCIMNumericValueImpl(value))); }
-void TCIMValue::Set(short value) { SetData(TType::kCIMTypeSint16, TData(TCIMNumericValueImpl(value))); }
-void TCIMValue::Set(unsigned int value) { SetData(TType::kCIMTypeUint32, TData(TCIMNumericValueImpl(value))); }
-void TCIMValue::Set(int value) { SetData(TType::kCIMTypeSint32, TData(TCIMNumericValueImpl(value))); }
-void TCIMValue::Set(unsigned long value) { SetData(TType::kCIMTypeUint64, TData(TCIMNumericValueImpl(value))); }
-void TCIMValue::Set(long value) { SetData(TType::kCIMTypeSint64, TData(TCIMNumericValueImpl(value))); }
-void TCIMValue::Set(float value) { SetData(TType::kCIMTypeReal32, TData(TCIMNumericValueImpl(value))); }
-void TCIMValue::Set(double value) { SetData(TType::kCIMTypeReal64, TData(TCIMNumericValueImpl(value))); }
-void TCIMValue::Set(TCIMChar16 const& value) {
-  SetData(TType::kCIMTypeChar16, TData(std::make_unique<TCIMChar16ValueImpl>(value)));
-}
-void TCIMValue::Set(char const* value) { SetData(TType::kCIMTypeString, TData(std::make_unique<TCIMStringValueImpl>(value))); }
-void TCIMValue::Set(std::string const& value) {
-  SetData(TType::kCIMTypeString, TData(std::make_unique<TCIMStringValueImpl>(value)));
-}
-
-void TCIMValue::Set(TCIMDateTime const& value) {
-  SetData(TType::kCIMTypeDateTime, TData(std::make_unique<TCIMDateTimeValueImpl>(value)));
-}
+void TCIMValue::Set(bool value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(unsigned char value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(signed char value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(unsigned short value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(short value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(unsigned int value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(int value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(unsigned long value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(long value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(float value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(double value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(TCIMChar16 const& value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(char const* value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(std::string const& value) { TakeData(TCIMValue(value)); }
+void TCIMValue::Set(TCIMDateTime const& value) { TakeData(TCIMValue(value)); }
 
 void TCIMValue::Set(TCIMReference& value) {
-  SetData(TType::kCIMTypeReference, TData(std::make_unique<TCIMReferenceValueImpl>(value)));
+  TCIMValue reference;
+  reference.fType = TType::kCIMTypeReference;
+  reference.fData = reference.NewData<TCIMReferenceValueImpl>(value);
+  TakeData(std::move(reference));
   fReferencedClass = value.GetClass();
 }
 
 void TCIMValue::Set(TCIMType type, unsigned int maxArraySize, std::vector<TCIMValue> const& elements) {
-  SetData(ArrayOf(type), TData(std::make_unique<TCIMArrayValueImpl>(elements)));
+  TCIMValue array;
+  array.fType = ArrayOf(type);
+  array.fData = array.NewData<TCIMArrayValueImpl>(elements);
+  TakeData(std::move(array));
   fMaxArraySize = maxArraySize;
   RequireElementsOf(ElementOf(type), *this);  // checks the copy: `elements` may have been this value's own
 }

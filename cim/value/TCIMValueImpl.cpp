@@ -28,9 +28,6 @@ TCIMValueImpl::operator TCIMDateTime() const { Refuse(); }
 TCIMValueImpl::operator TCIMReference() const { Refuse(); }
 TCIMValueImpl::operator std::vector<TCIMValue>&() const { Refuse(); }
 
-TCIMValueImpl const& TCIMValueImpl::DataOf(TCIMValue const& value) {
-  if (value.IsNull()) throw TZEPException(kZEPStatusValueIsNULL);
-  return *value.fData;
-}
+void TCIMValueImpl::RefuseNull() { throw TZEPException(kZEPStatusValueIsNULL); }
 
 }  // namespace NQRVZEP20

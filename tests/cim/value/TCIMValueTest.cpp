@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <functional>
 #include <limits>
+#include <random>
 
 namespace NQRVZEP20 {
 namespace {
@@ -721,6 +722,70 @@ TEST(TCIMValueTest, AVectorOfValuesGrowsWithoutADeepCopy) {
   TElements const* const elements = &ElementsOf(values[0]);
   for (int i = 0; i < 100; ++i) values.push_back(TCIMValue(i));
   EXPECT_EQ(&ElementsOf(values[0]), elements);
+}
+
+TCIMValue RandomValue(std::mt19937& random, int depth = 0) {
+  switch (random() % (depth == 0 ? 7 : 5)) {
+    case 0:
+      return TCIMValue();
+    case 1:
+      return TCIMValue(TType::kCIMTypeString, 0);
+    case 2:
+      return TCIMValue(static_cast<unsigned int>(random()));
+    case 3:
+      return TCIMValue(std::string(random() % 40, static_cast<char>('a' + random() % 26)));  // short and long
+    case 4:
+      return TCIMValue(static_cast<double>(random()) / 7);
+    case 5:
+      return TCIMValue(TCIMDateTime(random() % 1000, 1, 2, 3, 4));
+    default:
+      TElements const elements(random() % 4, TCIMValue(std::string(random() % 40, 'e')));
+      return TCIMValue(TType::kCIMTypeString, random() % 10, elements);
+  }
+}
+
+// Without the maximum size, which an assignment may keep.
+TState TypeAndDataOf(TCIMValue const& value) {
+  TState state(value);
+  state.fMaxArraySize = 0;
+  return state;
+}
+
+// The states that the values must have are kept apart from them.
+TEST(TCIMValueTest, RandomCopiesMovesAndAssignmentsKeepTheData) {
+  std::mt19937 random(18);
+  TElements values;
+  std::vector<TState> expected;
+  auto const add = [&](TCIMValue value, TState const& state) {
+    values.push_back(std::move(value));
+    expected.push_back(state);
+  };
+  for (int i = 0; i < 20; ++i) {
+    TCIMValue const value = RandomValue(random);
+    add(value, TypeAndDataOf(value));
+  }
+  for (int round = 0; round < 20000; ++round) {
+    std::size_t const to = random() % values.size(), from = random() % values.size();
+    TCIMValue const fresh = RandomValue(random);
+    switch (random() % 5) {
+      case 0:
+        if (!(values[to] == values[from])) values[to] = values[from], expected[to] = expected[from];
+        break;
+      case 1:
+        if (!(values[to] == fresh)) values[to] = TCIMValue(fresh), expected[to] = TypeAndDataOf(fresh);
+        break;
+      case 2:
+        std::swap(values[to], values[from]), std::swap(expected[to], expected[from]);
+        break;
+      case 3:
+        if (values.size() < 100) add(values[from], TState(expected[from]));
+        break;
+      default:
+        if (values.size() > 10) values.erase(values.begin() + to), expected.erase(expected.begin() + to);
+    }
+    if (round % 100 != 0) continue;
+    for (std::size_t i = 0; i < values.size(); ++i) ASSERT_EQ(TypeAndDataOf(values[i]), expected[i]) << "round " << round;
+  }
 }
 
 TEST(TCIMValueTest, ValuesAreSwappedAndSorted) {
