@@ -82,6 +82,8 @@ public:
   EZEPLogSeverity GetLogThreshold() override;
 
 private:
+  static void Record(EZEPLogSeverity severity, std::string const& message);
+
   std::string fLogFilename;  // set before the file is opened, and also when opening fails
   std::FILE* fLogFile = nullptr;
   bool fInitialized = false;

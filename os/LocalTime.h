@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "TCIMDateTime.h"
+
 #include <ctime>
 
 namespace NQRVZEP20 {
@@ -27,5 +29,8 @@ private:
 
   TCache& fCache;  // this thread's
 };
+
+// Sets a datetime to the local time, with milliseconds.
+void SetToLocalTime(TCIMDateTime& dateTime);
 
 }  // namespace NQRVZEP20

@@ -135,11 +135,6 @@ std::string LineOf(ILogger::EZEPLogSeverity severity, std::string const& message
   return line.append(head.View()).append(message).append("\n");
 }
 
-void Record(ILogger::EZEPLogSeverity severity, std::string const& message) {
-  ILogger::TLogEntry entry{severity, message, TOSSpecific::GetLocalTime()};
-  TLogger::PushBackLog(entry);
-}
-
 constexpr mode_t kOwnerOnly = S_IRUSR | S_IWUSR;
 
 // A file created here is readable by its owner only, whatever the umask: entries at debug severity may contain passwords.
@@ -193,6 +188,17 @@ void TLogger::PushBackLog(TLogEntry& entry) {
   if (!gListExists) return;
   boost::lock_guard<boost::recursive_mutex> const lock(fLogEntriesMutex);
   fLogEntries.push_back(entry);
+}
+
+// The entry is made in its place, before the lock is taken: copying it into the list would take as long as making it.
+void TLogger::Record(EZEPLogSeverity severity, std::string const& message) {
+  std::list<TLogEntry> entry(1);
+  entry.front().fSeverity = severity;
+  entry.front().fMessage = message;
+  SetToLocalTime(entry.front().fTimeStamp);
+  if (!gListExists) return;
+  boost::lock_guard<boost::recursive_mutex> const lock(fLogEntriesMutex);
+  fLogEntries.splice(fLogEntries.end(), entry);
 }
 
 std::list<ILogger::TLogEntry>& TLogger::GetLog() { return fLogEntries; }
