@@ -7,6 +7,7 @@
 #include <dirent.h>
 
 #include <string>
+#include <string_view>
 
 namespace NQRVZEP20 {
 
@@ -21,6 +22,6 @@ inline std::string WithTrailingSeparator(std::string path) {
   return path;
 }
 
-inline bool IsDotOrDotDot(std::string const& name) { return name == "." || name == ".."; }
+inline bool IsDotOrDotDot(std::string_view name) { return name == "." || name == ".."; }
 
 }  // namespace NQRVZEP20

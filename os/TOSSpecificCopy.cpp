@@ -53,21 +53,7 @@ ssize_t CopyRest(int from, int to) {
   }
 }
 
-// ---- Directories ----
-
-void CopyEntry(std::string const& from, std::string const& to, bool recursive) {
-  struct stat status;
-  if (::stat(from.c_str(), &status) != 0) return;
-  if (!S_ISDIR(status.st_mode))
-    TOSSpecific::FileCopy(from, to);
-  else if (recursive)
-    TOSSpecific::DirCopy(from, to, true);
-}
-
-}  // namespace
-
-void TOSSpecific::FileCopy(std::string from, std::string to) {
-  struct stat const status = StatusOrThrow(from);
+void CopyFile(std::string const& from, std::string const& to, struct stat const& status) {
   TUniqueFd const source = OpenOrThrow(from, O_RDONLY);
   // Not truncated: a destination that is longer than the source keeps its old tail. Kept.
   TUniqueFd const destination = OpenOrThrow(to, O_WRONLY | O_CREAT, status.st_mode);
@@ -75,6 +61,21 @@ void TOSSpecific::FileCopy(std::string from, std::string to) {
   if (S_ISREG(status.st_mode) && status.st_size >= kLargeFile) CopyInKernel(source.get(), destination.get());
   if (CopyRest(source.get(), destination.get()) != 0) throw TZEPException(kZEPStatusFileSystemError);
 }
+
+// ---- Directories ----
+
+void CopyEntry(std::string const& from, std::string const& to, bool recursive) {
+  struct stat status;
+  if (::stat(from.c_str(), &status) != 0) return;
+  if (!S_ISDIR(status.st_mode))
+    CopyFile(from, to, status);
+  else if (recursive)
+    TOSSpecific::DirCopy(from, to, true);
+}
+
+}  // namespace
+
+void TOSSpecific::FileCopy(std::string from, std::string to) { CopyFile(from, to, StatusOrThrow(from)); }
 
 int TOSSpecific::DirCopy(std::string from, std::string to, bool recursive) {
   from = WithTrailingSeparator(from);
