@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
 // Compares log entries with spdlog's: one that the threshold drops, and one that is written to a file and flushed. Both
-// loggers are reached as callers reach them, through the accessor function.
+// loggers are reached as callers reach them, through the accessor function. Entries that are only kept are compared with a list.
 
 #include "TLogger.h"
 #include "TRootObject.h"
@@ -10,8 +10,11 @@
 #include <spdlog/sinks/basic_file_sink.h>
 #include <spdlog/spdlog.h>
 #include <stdlib.h>
+#include <time.h>
 
+#include <ctime>
 #include <filesystem>
+#include <list>
 #include <stdexcept>
 #include <string>
 
@@ -74,5 +77,37 @@ void FlushedLine_spdlog(benchmark::State& state) {
   spdlog::set_level(spdlog::level::info);
 }
 BENCHMARK(FlushedLine_spdlog);
+
+// Entries that are only kept in the list.
+constexpr int kEntries = 1000;
+
+void KeptEntries_Zep(benchmark::State& state) {
+  for (auto _ : state) {
+    for (int i = 0; i < kEntries; ++i) TRootObject::GetCoreLogger()->OutputLogEntry(ILogger::kLogMemoryOnly, kMessage);
+    TLogger::GetInstance()->ClearLog();
+  }
+}
+BENCHMARK(KeptEntries_Zep);
+
+// The same list, filled by hand.
+void KeptEntries_List(benchmark::State& state) {
+  struct TEntry {
+    int fSeverity;
+    std::string fMessage;
+    std::tm fTime;
+    unsigned int fMicroSeconds;
+  };
+  std::list<TEntry> entries;
+  for (auto _ : state) {
+    for (int i = 0; i < kEntries; ++i) {
+      timespec now;
+      ::clock_gettime(CLOCK_REALTIME, &now);
+      entries.push_back({ILogger::kLogMemoryOnly, kMessage, std::tm(), static_cast<unsigned int>(now.tv_nsec / 1000)});
+      benchmark::DoNotOptimize(entries.back());
+    }
+    entries.clear();
+  }
+}
+BENCHMARK(KeptEntries_List);
 
 }  // namespace

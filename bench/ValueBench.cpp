@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Compares values with their peers: making and copying with boost::any, printing with std::to_chars, Poco and fmt, reading
-// with a standard stream.
+// Compares values with their peers: making and copying with boost::any and std::variant, comparing with std::variant, printing
+// with std::to_chars, Poco and fmt, reading with a standard stream.
 
 #include "TCIMValue.h"
 
@@ -16,6 +16,7 @@
 #include <random>
 #include <sstream>
 #include <string>
+#include <variant>
 #include <vector>
 
 namespace {
@@ -98,6 +99,58 @@ void Copy_Zep(benchmark::State& state) { Copy<TCIMValue>(state); }
 void Copy_BoostAny(benchmark::State& state) { Copy<boost::any>(state); }
 BENCHMARK(Copy_Zep);
 BENCHMARK(Copy_BoostAny);
+
+// A std::variant of the types of a value, which has its strings in place, too.
+using TVariant = std::variant<std::monostate, bool, unsigned char, signed char, unsigned short, short, unsigned int, int,
+                              unsigned long, long, float, double, std::string>;
+
+std::string const kShortText = "ProductName1", kLongText(64, 'x');
+
+template <class TValue>
+void MakeString(benchmark::State& state, std::string const& text) {
+  for (auto _ : state) {
+    TValue value(text);
+    benchmark::DoNotOptimize(value);
+  }
+}
+void MakeString_Zep(benchmark::State& state) { MakeString<TCIMValue>(state, kShortText); }
+BENCHMARK(MakeString_Zep);
+void MakeString_Variant(benchmark::State& state) { MakeString<TVariant>(state, kShortText); }
+BENCHMARK(MakeString_Variant);
+
+template <class TValue>
+void CopyString(benchmark::State& state, std::string const& text) {
+  TValue const value(text);
+  for (auto _ : state) {
+    TValue copy(value);
+    benchmark::DoNotOptimize(copy);
+  }
+}
+void CopyString_Zep(benchmark::State& state) { CopyString<TCIMValue>(state, kShortText); }
+BENCHMARK(CopyString_Zep);
+void CopyString_Variant(benchmark::State& state) { CopyString<TVariant>(state, kShortText); }
+BENCHMARK(CopyString_Variant);
+
+// ---- Comparing ----
+
+template <class TValue, class TSource>
+void Equal(benchmark::State& state, TSource const& source) {
+  TValue left(source), right(source);
+  for (auto _ : state) {
+    benchmark::DoNotOptimize(left);
+    benchmark::DoNotOptimize(left == right);
+  }
+}
+void EqualNumber_Zep(benchmark::State& state) { Equal<TCIMValue, unsigned int>(state, 1983u); }
+BENCHMARK(EqualNumber_Zep);
+void EqualNumber_Variant(benchmark::State& state) { Equal<TVariant, unsigned int>(state, 1983u); }
+BENCHMARK(EqualNumber_Variant);
+void EqualString_Zep(benchmark::State& state) { Equal<TCIMValue, std::string>(state, kLongText); }
+BENCHMARK(EqualString_Zep);
+void EqualString_Variant(benchmark::State& state) { Equal<TVariant, std::string>(state, kLongText); }
+BENCHMARK(EqualString_Variant);
+
+// ---- Arrays ----
 
 template <class TValue>
 void CopyArray(benchmark::State& state, TValue const& array) {
