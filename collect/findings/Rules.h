@@ -12,6 +12,7 @@ std::vector<TRule> StorageRules();
 std::vector<TRule> FileSystemRules();
 std::vector<TRule> NetworkRules();
 std::vector<TRule> DeviceRules();
+std::vector<TRule> SensorRules();
 std::vector<TRule> HostRules();
 std::vector<TRule> SystemRules();
 

@@ -62,8 +62,7 @@ struct TCounter {
 };
 
 void AskBadSectors(TRuleRun& run) {
-  constexpr TCounter counters[] = {{"PendingSectors", "sectors that cannot be read"},
-                                   {"UncorrectableErrors", "errors that could not be corrected"}};
+  constexpr TCounter counters[] = {{"PendingSectors", "unreadable sectors"}, {"UncorrectableErrors", "uncorrected errors"}};
   for (TElement const& health : run.Elements("ZEP_DiskHealth")) {
     for (auto const& [property, words] : counters) {
       auto const count = health.Number(property);
@@ -71,7 +70,7 @@ void AskBadSectors(TRuleRun& run) {
       run.Know(health, count);
       if (*count.fValue > 0)
         run.Add(health, count.fSource, ESeverity::kError,
-                "the disk " + health.Label() + " has " + std::to_string(*count.fValue) + " " + words,
+                "the disk " + health.Label() + " has " + words + ": " + std::to_string(*count.fValue),
                 "Save the data of this disk, test it (smartctl -t long), and replace it if the number grows.");
     }
     auto const reallocated = health.Number("ReallocatedSectors");
@@ -79,7 +78,7 @@ void AskBadSectors(TRuleRun& run) {
     run.Know(health, reallocated);
     if (*reallocated.fValue > run.Thresholds().fReallocatedSectors)
       run.Add(health, reallocated.fSource, ESeverity::kWarning,
-              "the disk " + health.Label() + " has replaced " + std::to_string(*reallocated.fValue) + " bad sectors",
+              "the disk " + health.Label() + " has replaced bad sectors: " + std::to_string(*reallocated.fValue),
               "Watch the number, and replace the disk if it grows.");
   }
 }

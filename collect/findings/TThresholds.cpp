@@ -21,6 +21,8 @@ constexpr TSetting kSettings[] = {
     {"finding-disk-used-percent", &TThresholds::fDiskUsedPercent, 255},
     {"finding-reallocated-sectors", &TThresholds::fReallocatedSectors, 1000000},
     {"finding-port-errors-per-million", &TThresholds::fPortErrorsPerMillion, 1000000},
+    {"finding-corrected-memory-errors", &TThresholds::fCorrectedMemoryErrors, 1000000000},
+    {"finding-corrected-pci-errors", &TThresholds::fCorrectedPciErrors, 1000000000},
     {"finding-clock-grace-minutes", &TThresholds::fClockGraceMinutes, 1000000},
 };
 

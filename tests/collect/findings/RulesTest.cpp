@@ -45,6 +45,11 @@ constexpr char const* kClasses = R"(
   class CIM_PCIDevice { [key] string DeviceID; uint8 ClassCode; };
   class ZEP_PCIExpressLink { [key] string DeviceID; uint16 Width; uint16 MaxWidth; real32 TransferRate; real32 MaxTransferRate; };
   [association] class CIM_ControlledBy { [key] CIM_PCIDevice ref Antecedent; [key] CIM_PCIDevice ref Dependent; };
+  class CIM_NumericSensor { [key] string DeviceID; string ElementName; uint16 SensorType; string CurrentState;
+    sint32 CurrentReading; };
+  class ZEP_MemoryErrors { [key] string InstanceID; string ElementName; uint64 CorrectedErrors; uint64 UncorrectedErrors; };
+  class ZEP_PCIErrors { [key] string InstanceID; string ElementName; uint64 CorrectableErrors; uint64 NonFatalErrors;
+    uint64 FatalErrors; };
   class CIM_Processor { [key] string DeviceID; string ElementName; string Stepping; };
   class ZEP_ProcessorSettings { [key] string InstanceID; string MicrocodeVersion; };
   class CIM_PhysicalMemory { [key] string Tag; string ElementName; string BankLabel; uint64 Capacity; uint16 MemoryType;
@@ -118,12 +123,11 @@ TEST(RulesTest, AWornDiskIsNamedWithItsWear) {
 }
 
 TEST(RulesTest, BadSectorsAreCounted) {
-  EXPECT_THAT(
-      Problems("disk-sectors", R"(
+  EXPECT_THAT(Problems("disk-sectors", R"(
       instance of ZEP_DiskHealth { InstanceID = "1"; ElementName = "sda"; PendingSectors = 8; UncorrectableErrors = 0;
                                    ReallocatedSectors = 51; };
       instance of ZEP_DiskHealth { InstanceID = "2"; ElementName = "sdb"; PendingSectors = 0; ReallocatedSectors = 50; };)"),
-      ElementsAre("error: the disk sda has 8 sectors that cannot be read", "warning: the disk sda has replaced 51 bad sectors"));
+              ElementsAre("error: the disk sda has unreadable sectors: 8", "warning: the disk sda has replaced bad sectors: 51"));
 }
 
 std::string Array(std::string const& state) {
@@ -273,6 +277,51 @@ TEST(RulesTest, ALinkIsComparedWithBothEnds) {
   EXPECT_THAT(Problems(rule, Link("Width = 16; MaxWidth = 32; TransferRate = 16.0; MaxTransferRate = 32.0;", network)), IsEmpty())
       << "the bridge allows no more";
   EXPECT_THAT(Problems(rule, Link("Width = 4;", network)), IsEmpty());
+}
+
+// ---- Sensors ----
+
+std::string Sensor(int type, std::string const& state, int reading = 1) {
+  return "instance of CIM_NumericSensor { DeviceID = \"1\"; ElementName = \"S1\"; SensorType = " + std::to_string(type) +
+         "; CurrentState = \"" + state + "\"; CurrentReading = " + std::to_string(reading) + "; };";
+}
+constexpr int kTemperature = 2, kVoltage = 3, kFan = 5;
+
+TEST(RulesTest, SensorsAreJudgedByTheirState) {
+  std::string const rule = "sensor-threshold";
+  EXPECT_THAT(Problems(rule, Sensor(kTemperature, "Upper Critical")),
+              ElementsAre("error: the sensor S1 is beyond a threshold (Upper Critical)"));
+  EXPECT_THAT(Problems(rule, Sensor(kTemperature, "Upper Non-Critical")),
+              ElementsAre("warning: the sensor S1 is beyond a threshold (Upper Non-Critical)"));
+  EXPECT_THAT(Problems(rule, Sensor(kVoltage, "Lower Critical")),
+              ElementsAre("error: the sensor S1 is beyond a threshold (Lower Critical)"));
+  EXPECT_THAT(Problems(rule, Sensor(kVoltage, "Upper Non-Critical")), IsEmpty()) << "such thresholds are often wrong";
+  EXPECT_THAT(Problems(rule, Sensor(kTemperature, "Normal")), IsEmpty());
+  EXPECT_THAT(Problems(rule, Sensor(kFan, "Lower Critical", 0)), IsEmpty()) << "fans have a rule of their own";
+}
+
+TEST(RulesTest, AFanThatDoesNotTurnAlthoughItShouldIsNamed) {
+  std::string const rule = "fan-stopped", reason = "error: the fan S1 has stopped or is broken";
+  EXPECT_THAT(Problems(rule, Sensor(kFan, "Lower Non-Critical", 0)), ElementsAre(reason));
+  EXPECT_THAT(Problems(rule, Sensor(kFan, "Fault", 900)), ElementsAre(reason));
+  EXPECT_THAT(Problems(rule, Sensor(kFan, "Normal", 0)), IsEmpty()) << "it has no lowest speed: it may stand still";
+  EXPECT_THAT(Problems(rule, Sensor(kFan, "Lower Non-Critical", 200)), IsEmpty());
+}
+
+TEST(RulesTest, ErrorsOfMemoryAndPciDevicesAreCounted) {
+  EXPECT_THAT(Problems("memory-errors", R"(
+      instance of ZEP_MemoryErrors { InstanceID = "1"; ElementName = "A1"; CorrectedErrors = 101; UncorrectedErrors = 2; };
+      instance of ZEP_MemoryErrors { InstanceID = "2"; ElementName = "A2"; CorrectedErrors = 100; UncorrectedErrors = 0; };)"),
+              ElementsAre("critical: the memory A1 has had uncorrected errors: 2",
+                          "warning: the memory A1 has had corrected errors: 101"));
+  EXPECT_THAT(Problems("pci-errors", R"(
+      instance of ZEP_PCIErrors { InstanceID = "1"; ElementName = "01:00.0"; CorrectableErrors = 1001; NonFatalErrors = 1;
+                                  FatalErrors = 3; };
+      instance of ZEP_PCIErrors { InstanceID = "2"; ElementName = "02:00.0"; CorrectableErrors = 1000; NonFatalErrors = 0;
+                                  FatalErrors = 0; };)"),
+              ElementsAre("error: the PCI Express device 01:00.0 has had fatal errors: 3",
+                          "warning: the PCI Express device 01:00.0 has had uncorrected errors: 1",
+                          "warning: the PCI Express device 01:00.0 has had corrected errors: 1001"));
 }
 
 // ---- Host ----

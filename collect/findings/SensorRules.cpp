@@ -1,0 +1,81 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/findings/Rules.h"
+
+namespace NQRVZEP20 {
+
+namespace {
+
+constexpr char const *kTemperature = "2", *kTachometer = "5";  // values of SensorType
+
+bool Is(TElement const& sensor, char const* type) {
+  auto const value = sensor.Text("SensorType");
+  return value.IsKnown() && *value.fValue == type;
+}
+
+bool Contains(std::string const& text, char const* part) { return text.find(part) != std::string::npos; }
+
+// Boards often have wrong thresholds for voltages and currents below the critical ones, so only temperatures are judged by them.
+void AskSensors(TRuleRun& run) {
+  for (TElement const& sensor : run.Elements("CIM_NumericSensor")) {
+    auto const state = sensor.Text("CurrentState");
+    if (Is(sensor, kTachometer) || !run.Know(sensor, state)) continue;
+    bool const isBeyond = Contains(*state.fValue, "Upper") || Contains(*state.fValue, "Lower");
+    bool const isCritical = isBeyond && !Contains(*state.fValue, "Non-Critical");
+    if (isCritical || (isBeyond && Is(sensor, kTemperature)))
+      run.Add(sensor, state.fSource, isCritical ? ESeverity::kError : ESeverity::kWarning,
+              "the sensor " + sensor.Label() + " is beyond a threshold (" + *state.fValue + ")",
+              Is(sensor, kTemperature) ? "Check the fans, the air flow and the temperature of the room."
+                                       : "Check the power supplies and the part that the sensor belongs to.");
+  }
+}
+
+void AskFans(TRuleRun& run) {
+  for (TElement const& sensor : run.Elements("CIM_NumericSensor")) {
+    if (!Is(sensor, kTachometer)) continue;
+    auto const state = sensor.Text("CurrentState"), reading = sensor.Text("CurrentReading");
+    if (!run.Know(sensor, state)) continue;
+    bool const hasStopped = Contains(*state.fValue, "Lower") && reading.IsKnown() && *reading.fValue == "0";
+    if (hasStopped || *state.fValue == "Fault")
+      run.Add(sensor, state.fSource, ESeverity::kError, "the fan " + sensor.Label() + " has stopped or is broken",
+              "Replace the fan.");
+  }
+}
+
+void AskMemoryErrors(TRuleRun& run) {
+  for (TElement const& errors : run.Elements("ZEP_MemoryErrors")) {
+    auto const corrected = errors.Number("CorrectedErrors"), uncorrected = errors.Number("UncorrectedErrors");
+    std::string const place = "the memory " + errors.Label() + " has had ";
+    if (run.Know(errors, uncorrected) && *uncorrected.fValue > 0)
+      run.Add(errors, uncorrected.fSource, ESeverity::kCritical,
+              place + "uncorrected errors: " + std::to_string(*uncorrected.fValue), "Replace the memory module.");
+    if (run.Know(errors, corrected) && *corrected.fValue > run.Thresholds().fCorrectedMemoryErrors)
+      run.Add(errors, corrected.fSource, ESeverity::kWarning, place + "corrected errors: " + std::to_string(*corrected.fValue),
+              "Watch the number, and replace the memory module if it grows.");
+  }
+}
+
+void AskPciErrors(TRuleRun& run) {
+  constexpr char const* remedy = "Seat the card anew; if the number grows, replace the card or the riser.";
+  for (TElement const& errors : run.Elements("ZEP_PCIErrors")) {
+    std::string const place = "the PCI Express device " + errors.Label() + " has had ";
+    auto const report = [&](char const* property, char const* kind, ESeverity severity, std::uint64_t highest) {
+      auto const count = errors.Number(property);
+      if (run.Know(errors, count) && *count.fValue > highest)
+        run.Add(errors, count.fSource, severity, place + kind + std::to_string(*count.fValue), remedy);
+    };
+    report("FatalErrors", "fatal errors: ", ESeverity::kError, 0);
+    report("NonFatalErrors", "uncorrected errors: ", ESeverity::kWarning, 0);
+    report("CorrectableErrors", "corrected errors: ", ESeverity::kWarning, run.Thresholds().fCorrectedPciErrors);
+  }
+}
+
+}  // namespace
+
+std::vector<TRule> SensorRules() {
+  return {{"sensor-threshold", "Is a sensor beyond its threshold?", AskSensors},
+          {"fan-stopped", "Has a fan stopped?", AskFans},
+          {"memory-errors", "Has the memory had errors?", AskMemoryErrors},
+          {"pci-errors", "Has a PCI Express device had errors?", AskPciErrors}};
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,106 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "SensorRecords.h"
+
+#include "ValueNames.h"
+
+namespace NQRVZEP20 {
+
+namespace {
+
+using EKind = TSensor::EKind;
+
+constexpr std::uint16_t kOK = 2, kStressed = 4, kError = 6;
+
+struct TKindNumbers {
+  std::uint16_t fSensorType, fBaseUnits;
+  std::int32_t fUnitModifier;  // readings are in this power of ten of the unit
+};
+
+TKindNumbers NumbersOf(EKind kind) {
+  constexpr std::uint16_t other = 1;
+  switch (kind) {
+    case EKind::kTemperature:
+      return {2, 2, -3};
+    case EKind::kFan:
+      return {5, 19, 0};
+    case EKind::kVoltage:
+      return {3, 5, -3};
+    case EKind::kCurrent:
+      return {4, 6, -3};
+    case EKind::kPower:
+      return {13, 7, -3};
+    default:
+      return {9, other, -3};
+  }
+}
+
+std::vector<std::string> PossibleStates() {
+  return {"Normal", "Lower Non-Critical", "Upper Non-Critical", "Lower Critical", "Upper Critical", "Upper Fatal", "Fault"};
+}
+
+std::vector<std::uint16_t> StatusFrom(std::string const& state) {
+  if (state == "Normal") return {kOK};
+  return {state.find("Non-Critical") != std::string::npos ? kStressed : kError};
+}
+
+std::string NameOf(TSensor const& sensor) { return sensor.fChip + " " + sensor.fName; }
+
+// The label of the board's maker, or else the name of the chip and its sensor.
+TFinding<std::string> ElementNameOf(TSensor const& sensor) {
+  return sensor.fLabel ? sensor.fLabel : TFinding<std::string>(NameOf(sensor));
+}
+
+}  // namespace
+
+TRecord SensorRecord(TSensor const& sensor, TComputerSystem const& system) {
+  TKindNumbers const numbers = NumbersOf(sensor.fKind);
+  auto const state = StateOf(sensor);
+  TRecord record("CIM_NumericSensor", "/sys/class/hwmon/");
+  system.AddDeviceKeys(record, NameOf(sensor));
+  record.Add("ElementName", ElementNameOf(sensor));
+  record.Add("Description", TFinding<std::string>(sensor.fPath));
+  record.Add("OperationalStatus", state.Then(StatusFrom)).Names(kOperationalStatusNames);
+  record.Add("SensorType", TFinding<std::uint16_t>(numbers.fSensorType)).Names(kSensorTypeNames);
+  record.Add("PossibleStates", TFinding<std::vector<std::string>>(PossibleStates()));
+  record.Add("CurrentState", state);
+  record.Add("BaseUnits", TFinding<std::uint16_t>(numbers.fBaseUnits)).Names(kBaseUnitsNames);
+  record.Add("UnitModifier", TFinding<std::int32_t>(numbers.fUnitModifier));
+  record.Add("CurrentReading", sensor.fReading);
+  record.Add("LowerThresholdNonCritical", sensor.fLowerNonCritical);
+  record.Add("UpperThresholdNonCritical", sensor.fUpperNonCritical);
+  record.Add("LowerThresholdCritical", sensor.fLowerCritical);
+  record.Add("UpperThresholdCritical", sensor.fUpperCritical);
+  record.Add("UpperThresholdFatal", sensor.fUpperFatal);
+  return record;
+}
+
+TRecord FanRecord(TSensor const& sensor, TComputerSystem const& system) {
+  TRecord record("CIM_Fan", "/sys/class/hwmon/");
+  system.AddDeviceKeys(record, NameOf(sensor));
+  record.Add("ElementName", ElementNameOf(sensor));
+  record.Add("OperationalStatus", StateOf(sensor).Then(StatusFrom)).Names(kOperationalStatusNames);
+  return record;
+}
+
+TRecord MemoryErrorsRecord(TMemoryErrors const& errors) {
+  TRecord record("ZEP_MemoryErrors", "/sys/devices/system/edac/", "CIM_StatisticalData");
+  record.AddKey("InstanceID", "ZEP:edac:" + errors.fName);
+  record.Add("ElementName", errors.fLabel ? errors.fLabel : TFinding<std::string>(errors.fName));
+  record.Add("Location", errors.fLocation);
+  record.Add("CorrectedErrors", errors.fCorrected);
+  record.Add("UncorrectedErrors", errors.fUncorrected);
+  return record;
+}
+
+TRecord PciErrorsRecord(TPciErrors const& errors) {
+  TRecord record("ZEP_PCIErrors", "/sys/bus/pci/devices/", "CIM_StatisticalData");
+  record.AddKey("InstanceID", "ZEP:aer:" + errors.fAddress);
+  record.Add("ElementName", TFinding<std::string>(errors.fAddress));
+  record.Add("CorrectableErrors", errors.fCorrectable);
+  record.Add("NonFatalErrors", errors.fNonFatal);
+  record.Add("FatalErrors", errors.fFatal);
+  record.Add("ErrorKinds", errors.fKinds);
+  return record;
+}
+
+}  // namespace NQRVZEP20
