@@ -290,6 +290,7 @@ std::map<std::string, TMisdeed> const kWhileLoading = {
     {"LoadCrashes", Crash},
     {"LoadExits", [] { std::exit(3); }},
     {"LoadHangs", [] { HangHere(); }},
+    {"DawdlesTwice", [] { ::sleep(3); }},
     {"LoadAborts", [] { std::abort(); }},
     {"LoadCloses",
      [] {
@@ -301,6 +302,7 @@ std::map<std::string, TMisdeed> const kWhileFilling = {
     {"Throws", [] { Log("the disk is gone"), throw TZEPFailure(kZEPStatusAccessDenied, "no disk"); }},
     {"ThrowsNullText", [] { throw TNoText(); }},
     {"Dawdles", [] { ::sleep(2); }},
+    {"DawdlesTwice", [] { ::sleep(3); }},
     {"ThrowsInAThread", [] { std::thread([] { throw std::runtime_error("in a thread"); }).join(); }},
     {"ThrowsWhileItMayNot", []() noexcept { ThrowHere("it may not"); }},
     {"Crashes", [] { Log("about to crash"), Crash(); }},

@@ -308,6 +308,15 @@ TEST_F(ProvidersTest, AsManyPlugInsWorkSideBySideAsThereAreProcessors) {
   }
 }
 
+// Three seconds for each.
+TEST_F(ProvidersTest, TheTimeLimitIsThatOfTheLoadAndAgainOfTheFill) {
+  fZep.Remove("libHost.nsp.so");
+  Add({"DawdlesTwice"});
+  TRun const run = Run({"classes", "--plugin-timeout", "5"});
+  EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+  EXPECT_THAT(run.fOutput, HasSubstr("X_DawdlesTwice"));
+}
+
 TEST_F(ProvidersTest, AClosedDescriptorIsNamedEvenIfTheTimeLimitIsShort) {
   fZep.Remove("libHost.nsp.so");
   Add({"Closes"});
