@@ -50,7 +50,7 @@ TRecord Negotiated(TFinding<std::uint64_t> const& speed) {
 }
 
 TFinding<std::uint64_t> LinkSpeedOf(TPciFunction const& function) {
-  if (function.fLinkSpeed) return *function.fLinkSpeed;
+  if (function.fLink) return function.fLink->fSpeed;
   return TMissing{kMissingNotGiven, "the kernel reports the speed of PCI Express links only"};
 }
 
@@ -63,7 +63,7 @@ void WritePci(TRecordWriter& writer, TMachineFiles const& files, TComputerSystem
 
   TRecords links;
   for (TPciFunction const& function : functions)
-    if (function.fLink) links.push_back(*function.fLink);
+    if (function.fLink) links.push_back(function.fLink->fRecord);
   writer.Write(PciLinkShape(system), links, {kMissingNotGiven, "the kernel lists no PCI Express devices"});
 }
 
@@ -73,7 +73,7 @@ void TiePci(TRecordWriter& writer, TRecord const& system, std::vector<TPciFuncti
     writer.Associate(kSystemDevice, system, function.fRecord);
     if (TRecord const* const bridge = Find(byName, function.fBridge))
       writer.Associate(kControlledBy, *bridge, function.fRecord, Negotiated(LinkSpeedOf(function)));
-    if (function.fLink) writer.Associate(kPortOnDevice, function.fRecord, *function.fLink);
+    if (function.fLink) writer.Associate(kPortOnDevice, function.fRecord, function.fLink->fRecord);
   }
 }
 

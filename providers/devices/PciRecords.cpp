@@ -16,7 +16,6 @@ using TText = TFinding<std::string>;
 
 std::string const kDevices = "/sys/bus/pci/devices/";
 std::string const kSlots = "/sys/bus/pci/slots/";
-constexpr std::size_t kHeaderSize = 64;  // of the configuration space
 constexpr std::uint32_t kClassOfBridges = 0x06;
 constexpr unsigned kPciBridge = 0x04;  // a subclass
 
@@ -27,8 +26,9 @@ class TPciFiles {
 public:
   TPciFiles() : fFiles(nullptr) {}
   TPciFiles(TMachineFiles const& files, std::string const& name)
-      : fFiles(&files), fDirectory(kDevices + name + "/"), fConfiguration(files.Beginning(fDirectory + "config", kHeaderSize)) {}
+      : fFiles(&files), fDirectory(kDevices + name + "/"), fNumbers(ReadNumbers()) {}
 
+  TFinding<TPciNumbers> const& Numbers() const { return fNumbers; }
   template <class T>
   TFinding<T> Number(char const* file) const {
     if (fFiles == nullptr) return Unread();
@@ -45,33 +45,32 @@ public:
   // A little-endian number in the header of the configuration space, which every user may read.
   template <class T>
   TFinding<T> Configuration(std::size_t offset) const {
-    return fConfiguration.Then([&](std::string const& bytes) -> TFinding<T> {
-      if (bytes.size() < offset + sizeof(T)) return TMissing{kMissingUnreadable, "the configuration space is cut off"};
+    if (fFiles == nullptr) return Unread();
+    return fFiles->Bytes(fDirectory + "config", offset, sizeof(T)).Then([](std::string const& bytes) -> TFinding<T> {
+      if (bytes.size() < sizeof(T)) return TMissing{kMissingUnreadable, "the configuration space is cut off"};
       T number = 0;
-      for (std::size_t at = sizeof(T); at-- > 0;)
-        number = static_cast<T>(number << 8 | static_cast<unsigned char>(bytes[offset + at]));
+      for (std::size_t at = sizeof(T); at-- > 0;) number = static_cast<T>(number << 8 | static_cast<unsigned char>(bytes[at]));
       return number;
     });
   }
   bool Has(char const* file) const { return fFiles != nullptr && fFiles->Exists(fDirectory + file); }
 
 private:
+  TFinding<TPciNumbers> ReadNumbers() const {
+    auto const cls = Number<std::uint32_t>("class");
+    auto const vendor = Number<std::uint16_t>("vendor"), device = Number<std::uint16_t>("device");
+    auto const subVendor = Number<std::uint16_t>("subsystem_vendor"), subDevice = Number<std::uint16_t>("subsystem_device");
+    if (!cls) return cls.Why();
+    if (!vendor) return vendor.Why();
+    if (!device) return device.Why();
+    return TPciNumbers{*vendor, *device, subVendor ? *subVendor : std::uint16_t(0), subDevice ? *subDevice : std::uint16_t(0),
+                       *cls};
+  }
+
   TMachineFiles const* fFiles;
   std::string fDirectory;
-  TFinding<std::string> fConfiguration = Unread();
+  TFinding<TPciNumbers> fNumbers = Unread();
 };
-
-TFinding<TPciNumbers> NumbersOf(TPciFiles const& function) {
-  auto const cls = function.Number<std::uint32_t>("class");
-  auto const vendor = function.Number<std::uint16_t>("vendor"), device = function.Number<std::uint16_t>("device");
-  auto const subVendor = function.Number<std::uint16_t>("subsystem_vendor"),
-             subDevice = function.Number<std::uint16_t>("subsystem_device");
-  if (!cls) return cls.Why();
-  if (!vendor) return vendor.Why();
-  if (!device) return device.Why();
-  return TPciNumbers{*vendor, *device, subVendor ? *subVendor : std::uint16_t(0), subDevice ? *subDevice : std::uint16_t(0),
-                     *cls};
-}
 
 // The vendor and the device: "Intel Corporation 82574L Gigabit Network Connection".
 TText FullNameOf(TPciNames const& names) {
@@ -88,9 +87,9 @@ TFinding<std::uint16_t> SubsystemNumber(TFinding<TPciNumbers> const& numbers, st
 }
 
 // The last two hexadecimal digits of the class.
-std::string ProgrammingInterfaceFrom(std::uint32_t cls) {
+std::string ProgrammingInterfaceFrom(TPciNumbers const& numbers) {
   char text[3];
-  std::snprintf(text, sizeof text, "%02x", cls & 0xffu);
+  std::snprintf(text, sizeof text, "%02x", numbers.fClass & 0xffu);
   return text;
 }
 
@@ -98,7 +97,7 @@ TIdentifiers IdentifiersOf(TPciFiles const& function, TPciNames const& names) {
   TIdentifiers identifiers;
   identifiers.Add("Vendor", names.fVendor);
   identifiers.Add("Subsystem", names.fSubsystem);
-  identifiers.Add("Programming interface", function.Number<std::uint32_t>("class").Then(ProgrammingInterfaceFrom));
+  identifiers.Add("Programming interface", function.Numbers().Then(ProgrammingInterfaceFrom));
   identifiers.Add("Driver", function.RealName("driver"));
   identifiers.Add("Kernel module", function.RealName("driver/module"));
   identifiers.Add("Firmware label", function.Line("label"));
@@ -111,7 +110,7 @@ TIdentifiers IdentifiersOf(TPciFiles const& function, TPciNames const& names) {
 
 TRecord FunctionRecord(char const* className, TComputerSystem const& system, std::string const& name, TPciAddress const& address,
                        TPciFiles const& function, TPciNames const& names) {
-  auto const numbers = NumbersOf(function);
+  auto const& numbers = function.Numbers();
   TRecord record(className, "pci.ids");
   system.AddDeviceKeys(record, name);
   record.Add("Name", FullNameOf(names));
@@ -137,9 +136,9 @@ TRecord FunctionRecord(char const* className, TComputerSystem const& system, std
 }
 
 TFinding<std::uint16_t> BridgeTypeOf(TPciFiles const& function) {
-  return function.Number<std::uint32_t>("class").Then([&](std::uint32_t cls) {
+  return function.Numbers().Then([&](TPciNumbers const& numbers) {
     constexpr std::uint16_t pciExpress = 10, other = 128, lastOfPci = 0x08;
-    unsigned const subclass = (cls >> 8) & 0xff;
+    unsigned const subclass = (numbers.fClass >> 8) & 0xff;
     if (subclass == kPciBridge && function.Has("current_link_speed")) return pciExpress;
     // CIM numbers the other bridges as the PCI standard does, up to RACEway.
     return subclass <= lastOfPci ? static_cast<std::uint16_t>(subclass) : other;
@@ -173,25 +172,22 @@ TFinding<std::uint64_t> SpeedOf(TFinding<float> const& rate, TFinding<std::uint1
       [&](float transfers) { return width.Then([&](std::uint16_t lanes) { return PciSpeedFrom(transfers, lanes); }); });
 }
 
-TFinding<std::uint64_t> CurrentSpeedOf(TPciFiles const& function) {
-  return SpeedOf(RateOf(function, "current_link_speed"), WidthOf(function, "current_link_width"));
-}
-
-TRecord LinkRecord(TComputerSystem const& system, std::string const& name, TPciFiles const& function) {
+TPciLink LinkOf(TComputerSystem const& system, std::string const& name, TPciFiles const& function) {
   constexpr unsigned short pciExpress = 152;
-  auto const maxRate = RateOf(function, "max_link_speed");
-  auto const maxWidth = WidthOf(function, "max_link_width");
+  auto const rate = RateOf(function, "current_link_speed"), maxRate = RateOf(function, "max_link_speed");
+  auto const width = WidthOf(function, "current_link_width"), maxWidth = WidthOf(function, "max_link_width");
+  auto const speed = SpeedOf(rate, width);
 
   TRecord record("ZEP_PCIExpressLink", "sysfs", "CIM_PCIPort");
   system.AddDeviceKeys(record, name);
   record.AddOwn("PortType", pciExpress).Names(kPortTypeNames);
-  record.Add("TransferRate", RateOf(function, "current_link_speed"));
+  record.Add("TransferRate", rate);
   record.Add("MaxTransferRate", maxRate);
-  record.Add("Width", WidthOf(function, "current_link_width"));
+  record.Add("Width", width);
   record.Add("MaxWidth", maxWidth);
-  record.Add("Speed", CurrentSpeedOf(function)).Unit("bit / second");
+  record.Add("Speed", speed).Unit("bit / second");
   record.Add("MaxSpeed", SpeedOf(maxRate, maxWidth)).Unit("bit / second");
-  return record;
+  return {record, speed};
 }
 
 // The name of the bridge above: the directory of a function lies in that of its bridge.
@@ -201,11 +197,6 @@ std::string BridgeAbove(TMachineFiles const& files, std::string const& name) {
   std::string const above = path->substr(0, path->rfind('/'));
   std::string const bridge = above.substr(above.rfind('/') + 1);
   return PciAddressFrom(bridge) ? bridge : "";
-}
-
-bool IsBridge(TPciFiles const& function) {
-  auto const cls = function.Number<std::uint32_t>("class");
-  return cls && *cls >> 16 == kClassOfBridges;
 }
 
 TPciNames NoNames() { return {Unread(), Unread(), Unread(), Unread()}; }
@@ -218,17 +209,14 @@ std::vector<TPciFunction> PciFunctions(TMachineFiles const& files, TComputerSyst
   for (std::string const& name : files.Names(kDevices)) {
     auto const address = PciAddressFrom(name);
     TPciFiles const function(files, name);
-    auto const numbers = NumbersOf(function);
-    if (!address || !numbers) continue;
-    TPciNames const names = ids.NamesOf(*numbers, files);
-    bool const isBridge = IsBridge(function);
+    if (!address || !function.Numbers()) continue;
+    TPciNames const names = ids.NamesOf(*function.Numbers(), files);
+    bool const isBridge = function.Numbers()->fClass >> 16 == kClassOfBridges;
     functions.push_back({name, *address, BridgeAbove(files, name), isBridge,
                          isBridge ? BridgeRecord(system, name, *address, function, names)
                                   : FunctionRecord("CIM_PCIDevice", system, name, *address, function, names),
-                         std::nullopt, std::nullopt});
-    if (!function.Has("current_link_speed")) continue;
-    functions.back().fLink = LinkRecord(system, name, function);
-    functions.back().fLinkSpeed = CurrentSpeedOf(function);
+                         std::nullopt});
+    if (function.Has("current_link_speed")) functions.back().fLink = LinkOf(system, name, function);
   }
   std::sort(functions.begin(), functions.end(), [](TPciFunction const& a, TPciFunction const& b) { return a.fName < b.fName; });
   return functions;
@@ -238,7 +226,7 @@ TRecord PciDeviceShape(TComputerSystem const& system) {
   return FunctionRecord("CIM_PCIDevice", system, "", {}, TPciFiles(), NoNames());
 }
 TRecord PciBridgeShape(TComputerSystem const& system) { return BridgeRecord(system, "", {}, TPciFiles(), NoNames()); }
-TRecord PciLinkShape(TComputerSystem const& system) { return LinkRecord(system, "", TPciFiles()); }
+TRecord PciLinkShape(TComputerSystem const& system) { return LinkOf(system, "", TPciFiles()).fRecord; }
 
 TMissing WhyNoPciDevices(TMachineFiles const& files) {
   if (!files.Exists(kDevices)) return {kMissingNotGiven, "the kernel lists no PCI devices: " + kDevices + " does not exist"};

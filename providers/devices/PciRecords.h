@@ -15,15 +15,20 @@ namespace NQRVZEP20 {
 
 // The PCI functions of a machine as records of CIM classes, from /sys/bus/pci.
 
+// The link of a PCI Express function.
+struct TPciLink {
+  TRecord fRecord;                 // ZEP_PCIExpressLink
+  TFinding<std::uint64_t> fSpeed;  // now, in bits per second
+};
+
 // A function that the kernel lists.
 struct TPciFunction {
   std::string fName;  // "0000:03:00.0"
   TPciAddress fAddress;
   std::string fBridge;  // the name of the bridge above; empty on a root bus
   bool fIsBridge;
-  TRecord fRecord;                                    // CIM_PCIDevice or CIM_PCIBridge
-  std::optional<TRecord> fLink;                       // ZEP_PCIExpressLink, only of a PCI Express function
-  std::optional<TFinding<std::uint64_t>> fLinkSpeed;  // in bits per second, only of a PCI Express function
+  TRecord fRecord;                // CIM_PCIDevice or CIM_PCIBridge
+  std::optional<TPciLink> fLink;  // only of a PCI Express function
 };
 
 // In the order of their addresses. A function that is removed during the call is omitted.

@@ -113,16 +113,17 @@ TMachineFiles::TMachineFiles(std::string root) : fRoot(std::move(root)) {
 }
 
 TFinding<std::string> TMachineFiles::Content(std::string const& path, std::size_t limit) const {
-  return Beginning(path, limit + 1).Then([&](std::string const& content) -> TFinding<std::string> {
+  return Bytes(path, 0, limit + 1).Then([&](std::string const& content) -> TFinding<std::string> {
     if (content.size() <= limit) return content;
     return TMissing{kMissingUnreadable, path + " is longer than " + std::to_string(limit) + " bytes"};
   });
 }
 
-TFinding<std::string> TMachineFiles::Beginning(std::string const& path, std::size_t length) const {
+TFinding<std::string> TMachineFiles::Bytes(std::string const& path, std::size_t offset, std::size_t length) const {
   TFd const file = OpenBelow(fRoot, path, O_RDONLY);
   if (!file) return WhyUnreadable(path, errno);
   if (!IsRegularFile(file.Get())) return TMissing{kMissingUnreadable, path + " is not a regular file"};
+  if (offset != 0 && ::lseek(file.Get(), static_cast<off_t>(offset), SEEK_SET) < 0) return WhyUnreadable(path, errno);
   std::string content;
   if (!ReadUpTo(file.Get(), length, content)) return WhyUnreadable(path, errno);
   return content;

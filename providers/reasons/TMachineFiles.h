@@ -35,9 +35,9 @@ public:
   // `limit` bytes.
   TFinding<std::string> Content(std::string const& path, std::size_t limit = std::size_t(1) << 20) const;
 
-  // The first `length` bytes; fewer if the file is shorter. Nothing after them is read, because some files of sysfs are slow:
-  // each byte of a PCI configuration space is a query of the device. Missing like Content, but a file may be longer.
-  TFinding<std::string> Beginning(std::string const& path, std::size_t length) const;
+  // The `length` bytes from `offset`; fewer if the file ends before. No others are read, because some files of sysfs are slow:
+  // each word of a PCI configuration space is a query of the device. Missing like Content, but a file may be longer.
+  TFinding<std::string> Bytes(std::string const& path, std::size_t offset, std::size_t length) const;
 
   // The first line, without blanks at either end. Missing like Content, and if the line is empty.
   TFinding<std::string> Line(std::string const& path) const;

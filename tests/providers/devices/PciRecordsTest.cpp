@@ -99,14 +99,14 @@ TEST_F(PciRecordsTest, ALinkHasItsSpeedNowAndAtMost) {
   auto const functions = Functions();
   ASSERT_EQ(functions.size(), 1u);
   ASSERT_TRUE(functions[0].fLink);
-  TRecord const& link = *functions[0].fLink;
+  TRecord const& link = functions[0].fLink->fRecord;
   EXPECT_EQ(ValueIn(link, "TransferRate"), "2.5");
   EXPECT_EQ(ValueIn(link, "MaxTransferRate"), "5");
   EXPECT_EQ(ValueIn(link, "Width"), "1");
   EXPECT_EQ(ValueIn(link, "MaxWidth"), "4");
   EXPECT_EQ(ValueIn(link, "Speed"), "2000000000");
   EXPECT_EQ(ValueIn(link, "MaxSpeed"), "16000000000");
-  EXPECT_EQ(**functions[0].fLinkSpeed, 2000000000u);
+  EXPECT_EQ(*functions[0].fLink->fSpeed, 2000000000u);
 }
 
 TEST_F(PciRecordsTest, AFunctionKnowsTheBridgeAbove) {

@@ -73,11 +73,14 @@ TEST_F(TMachineFilesTest, AFileOfExactlyTheLimitIsRead) {
   EXPECT_EQ(Shown(fFiles.Content("/file", 9999)), "unreadable: /file is longer than 9999 bytes");
 }
 
-TEST_F(TMachineFilesTest, TheBeginningOfAFileMayBeRead) {
+TEST_F(TMachineFilesTest, APartOfAFileMayBeRead) {
   Write("/file", "0123456789");
-  EXPECT_EQ(Shown(fFiles.Beginning("/file", 4)), "0123");
-  EXPECT_EQ(Shown(fFiles.Beginning("/file", 11)), "0123456789");
-  EXPECT_EQ(Shown(fFiles.Beginning("/none", 4)), "not-given: /none does not exist");
+  EXPECT_EQ(Shown(fFiles.Bytes("/file", 0, 4)), "0123");
+  EXPECT_EQ(Shown(fFiles.Bytes("/file", 6, 2)), "67");
+  EXPECT_EQ(Shown(fFiles.Bytes("/file", 0, 11)), "0123456789");
+  EXPECT_EQ(Shown(fFiles.Bytes("/file", 8, 4)), "89");
+  EXPECT_EQ(Shown(fFiles.Bytes("/file", 11, 4)), "");
+  EXPECT_EQ(Shown(fFiles.Bytes("/none", 0, 4)), "not-given: /none does not exist");
 }
 
 TEST_F(TMachineFilesTest, AFileOfRootNamesRoot) {
