@@ -33,8 +33,8 @@ TPropertyDecl OverriddenBy(ICIMPropertyDecl const& property) {
 // The texts of a qualifier that is an array of strings, of the property itself or the nearest one that it overrides.
 std::vector<std::string> TextsOf(ICIMPropertyDecl const& property, std::string const& qualifierName) {
   auto qualifier = property.GetQualifier(qualifierName, TCIMContext());
-  for (TPropertyDecl above = OverriddenBy(property); above && !qualifier; above = OverriddenBy(*above))
-    qualifier = above->GetQualifier(qualifierName, TCIMContext());
+  TPropertyDecl above = qualifier ? nullptr : OverriddenBy(property);
+  for (; above && !qualifier; above = OverriddenBy(*above)) qualifier = above->GetQualifier(qualifierName, TCIMContext());
 
   std::vector<std::string> texts;
   TCIMValue const value = qualifier ? qualifier->GetValue(TCIMContext()) : TCIMValue();
@@ -70,6 +70,7 @@ bool Holds(std::string_view entry, TNumber number) {
 
 TValueWords::TValueWords(ICIMPropertyDecl const& property) {
   std::vector<std::string> const words = TextsOf(property, "Values");
+  if (words.empty()) return;
   std::vector<std::string> entries = TextsOf(property, "ValueMap");
   if (entries.empty())
     for (std::size_t number = 0; number < words.size(); ++number) entries.push_back(std::to_string(number));

@@ -143,7 +143,7 @@ int Deliver(TReport const& report, TTarget const& target, TArguments const& argu
     document["exitStatus"] = static_cast<int>(status);
     document["reason"] = CountsOf(report.fFindings);
   }
-  if (arguments.fAsJson) WriteOutput(AsText(document));
+  if (arguments.fAsJson) WriteOutput(AsText(std::move(document)));
   return status;
 }
 

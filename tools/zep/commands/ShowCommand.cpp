@@ -240,7 +240,7 @@ std::string ElementAsText(TNamespaceView const& view, boost::shared_ptr<ICIMElem
 
 TJson ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElement> const& element) {
   return ForElement(
-      element, [&](ICIMInstance const& instance) { return InstanceAsJson(view, instance); },
+      element, [&](ICIMInstance const& instance) { return TInstanceJson(view).Of(instance); },
       [&](boost::shared_ptr<ICIMClass const> cls) { return ClassAsJson(view, cls); });
 }
 

@@ -2,10 +2,6 @@
 #include "tools/zep/output/Json.h"
 
 #include "ICIMClass.h"
-#include "ICIMInstance.h"
-#include "ICIMProperty.h"
-#include "ICIMPropertyDecl.h"
-#include "collect/TValueWords.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/secrets/Secrets.h"
 
@@ -36,35 +32,18 @@ TJson WordsAsJson(TValueWords const& words, TCIMValue const& value) {
   return array;
 }
 
-TJson PropertyAsJson(TNamespaceView const& view, ICIMInstance const& instance, ICIMProperty const& property) {
-  TCIMValue const value = property.GetValue(TCIMContext());
-  TJson json = {{"type", NameOf(value.GetType())}, {"value", ValueAsJson(value)}};
-  auto const declaration = property.GetDeclaration(TCIMContext());
-  TJson const words = WordsAsJson(TValueWords(*declaration), value);
-  if (!words.is_null()) json["words"] = words;
-  if (declaration->IsKey(TCIMContext())) json["key"] = true;
-  json["source"] = view.SourceOf(*declaration);
-  if (value.IsNull()) {
-    TMissing const why = view.WhyMissing(instance, property.GetName(TCIMContext()));
-    json["code"] = why.fCode;
-    json["reason"] = why.fReason;
-  }
-  return json;
-}
-
 // Whether the member contains a message or repeats an argument. All others contain data, which is printed unchanged.
 bool IsMessage(std::string const& key) {
   constexpr char const* kMessages[] = {"reason", "error", "failure", "lastLogLine", "words", "host", "url", "proxy", "command"};
   return std::find(std::begin(kMessages), std::end(kMessages), key) != std::end(kMessages);
 }
 
-TJson WithoutSecretsIn(TJson json, bool isMessage = false) {
-  if (json.is_string()) return isMessage ? TJson(MessageWithoutSecrets(json.get<std::string>())) : json;
+void HideSecretsIn(TJson& json, bool isMessage = false) {
+  if (json.is_string() && isMessage) json = MessageWithoutSecrets(json.get<std::string>());
   if (json.is_object())
-    for (auto& [key, value] : json.items()) value = WithoutSecretsIn(std::move(value), IsMessage(key));
+    for (auto& [key, value] : json.items()) HideSecretsIn(value, IsMessage(key));
   else if (json.is_array())
-    for (TJson& value : json) value = WithoutSecretsIn(std::move(value), isMessage);
-  return json;
+    for (TJson& value : json) HideSecretsIn(value, isMessage);
 }
 
 }  // namespace
@@ -77,12 +56,16 @@ TJson DocumentHead(std::string const& what, EExitStatus status, std::string cons
   return document;
 }
 
-std::string AsText(TJson const& document) { return AsVerbatimText(WithoutSecretsIn(document)); }
+std::string AsText(TJson document) {
+  HideSecretsIn(document);
+  return AsVerbatimText(document);
+}
 
 std::string AsVerbatimText(TJson const& document) { return document.dump(2, ' ', false, TJson::error_handler_t::replace) + "\n"; }
 
-std::string AsLine(TJson const& document) {
-  return WithoutSecretsIn(document).dump(-1, ' ', false, TJson::error_handler_t::replace) + "\n";
+std::string AsLine(TJson document) {
+  HideSecretsIn(document);
+  return document.dump(-1, ' ', false, TJson::error_handler_t::replace) + "\n";
 }
 
 TJson OrNull(std::string const& text) { return text.empty() ? TJson(nullptr) : TJson(text); }
@@ -122,19 +105,47 @@ std::string NameOf(TCIMValue::TCIMType type) {
   return type.ToString() + ((type & TType::kCIMTypeArrayFlag) != 0 ? "[]" : "");
 }
 
-TJson InstanceAsJson(TNamespaceView const& view, ICIMInstance const& instance) {
-  TJson properties = TJson::object();
+TInstanceJson::TInstanceJson(TNamespaceView const& view) : fView(view) {}
+
+TJson TInstanceJson::Of(ICIMInstance const& instance) {
+  TJson json = TJson::object();
+  json["path"] = fView.PathOf(instance);
+  json["provider"] = fView.GetProviderName();
+  json["namespace"] = fView.GetName();
+  json["class"] = instance.GetClass(TCIMContext())->GetName(TCIMContext());
+  TJson& properties = json["properties"] = TJson::object();
   instance.EnumerateProperties(
       [&](boost::shared_ptr<ICIMProperty> property) {
-        properties[property->GetName(TCIMContext())] = PropertyAsJson(view, instance, *property);
+        properties[property->GetName(TCIMContext())] = PropertyAsJson(instance, *property);
         return true;
       },
       TCIMContext());
-  return {{"path", view.PathOf(instance)},
-          {"provider", view.GetProviderName()},
-          {"namespace", view.GetName()},
-          {"class", instance.GetClass(TCIMContext())->GetName(TCIMContext())},
-          {"properties", properties}};
+  return json;
+}
+
+TJson TInstanceJson::PropertyAsJson(ICIMInstance const& instance, ICIMProperty const& property) {
+  TCIMValue const value = property.GetValue(TCIMContext());
+  TDeclared const& declared = DeclaredBy(property.GetDeclaration(TCIMContext()));
+  TJson json = TJson::object();
+  json["type"] = NameOf(value.GetType());
+  json["value"] = ValueAsJson(value);
+  TJson words = WordsAsJson(declared.fWords, value);
+  if (!words.is_null()) json["words"] = std::move(words);
+  if (declared.fIsKey) json["key"] = true;
+  json["source"] = declared.fSource;
+  if (value.IsNull()) {
+    TMissing const why = fView.WhyMissing(instance, property.GetName(TCIMContext()));
+    json["code"] = why.fCode;
+    json["reason"] = why.fReason;
+  }
+  return json;
+}
+
+TInstanceJson::TDeclared const& TInstanceJson::DeclaredBy(TDeclaration const& declaration) {
+  auto const found = fDeclared.find(declaration);
+  if (found != fDeclared.end()) return found->second;
+  TDeclared declared{TValueWords(*declaration), declaration->IsKey(TCIMContext()), fView.SourceOf(*declaration)};
+  return fDeclared.emplace(declaration, std::move(declared)).first->second;
 }
 
 }  // namespace NQRVZEP20::zep

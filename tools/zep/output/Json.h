@@ -1,8 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "ICIMInstance.h"
+#include "ICIMProperty.h"
+#include "ICIMPropertyDecl.h"
 #include "TCIMValue.h"
 #include "collect/TNamespaceView.h"
+#include "collect/TValueWords.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Output.h"
@@ -10,6 +14,7 @@
 #include <nlohmann/json.hpp>
 
 #include <exception>
+#include <map>
 #include <string>
 
 namespace NQRVZEP20::zep {
@@ -27,8 +32,8 @@ TJson DocumentHead(std::string const& what, EExitStatus status, std::string cons
 // A document as text, indented or on one line. Bytes that are not valid UTF-8 become the replacement character. In members that
 // contain a message, such as "reason", or repeat an argument, such as "url", passwords are hidden (Secrets.h); the others are
 // data and are printed verbatim.
-std::string AsText(TJson const& document);
-std::string AsLine(TJson const& document);
+std::string AsText(TJson document);
+std::string AsLine(TJson document);
 
 // Like AsText, but with the messages verbatim, too, for a document that is sent or stored.
 std::string AsVerbatimText(TJson const& document);
@@ -48,7 +53,29 @@ TJson ValueAsJson(TCIMValue const& value);
 // The name of the type, followed by "[]" for an array.
 std::string NameOf(TCIMValue::TCIMType type);
 
-// An instance with its path and all properties, each with type, value, source, and for a missing value the reason.
-TJson InstanceAsJson(TNamespaceView const& view, ICIMInstance const& instance);
+// Writes instances of a namespace. The declarations of their properties, which many instances share, are read once.
+//
+// Refers to the view, which must outlive the object.
+class TInstanceJson {
+public:
+  explicit TInstanceJson(TNamespaceView const& view);
+
+  // The instance with its path and all properties, each with type, value, source, and for a missing value the reason.
+  TJson Of(ICIMInstance const& instance);
+
+private:
+  using TDeclaration = boost::shared_ptr<ICIMPropertyDecl const>;
+  struct TDeclared {
+    TValueWords fWords;
+    bool fIsKey;
+    std::string fSource;
+  };
+
+  TJson PropertyAsJson(ICIMInstance const& instance, ICIMProperty const& property);
+  TDeclared const& DeclaredBy(TDeclaration const& declaration);
+
+  TNamespaceView const& fView;
+  std::map<TDeclaration, TDeclared> fDeclared;
+};
 
 }  // namespace NQRVZEP20::zep

@@ -35,8 +35,9 @@ void AddInstances(TJson& document, std::vector<TPlugIn> const& plugIns) {
   TJson& instances = document["instances"] = TJson::array();
   TJson failures = TJson::array();
   for (TNamespaceView const& view : ViewsOf(plugIns)) {
+    TInstanceJson json(view);
     std::string const failure = FailureOf([&] {
-      for (auto const& instance : view.AllInstances()) instances.push_back(InstanceAsJson(view, *instance));
+      for (auto const& instance : view.AllInstances()) instances.push_back(json.Of(*instance));
     });
     if (!failure.empty()) failures.push_back({{"provider", view.GetProviderName()}, {"error", failure}});
   }
