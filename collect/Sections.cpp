@@ -13,7 +13,9 @@
 #include "collect/UnitText.h"
 
 #include <algorithm>
+#include <charconv>
 #include <map>
+#include <optional>
 #include <set>
 
 namespace NQRVZEP20 {
@@ -27,10 +29,18 @@ constexpr char const* kOther = "other";
 constexpr char const* kIdentifiers = "OtherIdentifyingInfo";
 constexpr char const* kIdentifierKinds = "IdentifyingDescriptions";
 
+enum class ECell {
+  kProperty,
+  kIdentifier,  // the element of the array that has the description fOther
+  kProduct,     // a size in bytes: the property times the property fOther
+  kEither       // the property fOther where the first has no value
+};
+
 struct TColumn {
   char const* fTitle;
   char const* fProperty;
-  char const* fKind = nullptr;  // of an identifier: the element of OtherIdentifyingInfo with this description
+  ECell fCell = ECell::kProperty;
+  char const* fOther = nullptr;
 };
 
 // A section for the instances of a class and its subclasses.
@@ -66,14 +76,20 @@ std::vector<TSubject> const& Subjects() {
        "CIM_MediaAccessDevice",
        {{"Disk", "DeviceID"},
         {"Model", "ElementName"},
-        {"Serial number", kIdentifiers, "Serial number"},
+        {"Serial number", kIdentifiers, ECell::kIdentifier, "Serial number"},
         {"Size", "MaxMediaSize"},
+        {"Status", "StatusDescriptions"}}},
+      {"volumes",
+       "Volumes",
+       "CIM_StorageVolume",
+       {{"Volume", "DeviceID"},
+        {"Name", "ElementName"},
+        {"Size", "NumberOfBlocks", ECell::kProduct, "BlockSize"},
         {"Status", "StatusDescriptions"}}},
       {"file-systems",
        "File systems",
        "CIM_LocalFileSystem",
        {{"File system", "Name"},
-
         {"Type", "FileSystemType"},
         {"Size", "FileSystemSize"},
         {"Free", "AvailableSpace"},
@@ -90,10 +106,22 @@ std::vector<TSubject> const& Subjects() {
        "IP addresses",
        "CIM_IPProtocolEndpoint",
        {{"Address", "ElementName"}, {"Interface", "InterfaceName"}, {"Origin", "AddressOrigin"}, {"Scope", "Scope"}}},
+      {"routes",
+       "Routes",
+       "CIM_NextHopIPRoute",
+       {{"Destination", "DestinationAddress"},
+        {"Mask or prefix", "DestinationMask", ECell::kEither, "PrefixLength"},
+        {"Gateway", "Gateway"},
+        {"Interface", "InterfaceName"},
+        {"Metric", "Metric"},
+        {"Set by", "Protocol"}}},
       {"pci",
        "PCI devices",
        "CIM_PCIDevice",
-       {{"Address", "DeviceID"}, {"Device", "Name"}, {"Class", "Caption"}, {"Driver", kIdentifiers, "Driver"}}},
+       {{"Address", "DeviceID"},
+        {"Device", "Name"},
+        {"Class", "Caption"},
+        {"Driver", kIdentifiers, ECell::kIdentifier, "Driver"}}},
       {"usb",
        "USB devices",
        "CIM_USBDevice",
@@ -147,6 +175,41 @@ TCell IdentifierCell(TNamespaceView const& view, ICIMInstance const& instance, s
   return TCell::Unknown({kMissingNotGiven, "the provider gives none"}, identifiers.fSource);
 }
 
+// A whole number that is not negative; none for any other value.
+std::optional<std::uint64_t> NumberIn(TAnswer<TCIMValue> const& answer) {
+  std::string const text = answer.fValue->ToString();
+  std::uint64_t number = 0;
+  auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+  if (error != std::errc() || end != text.data() + text.size()) return std::nullopt;
+  return number;
+}
+
+TCell ProductCell(TNamespaceView const& view, ICIMInstance const& instance, std::string const& one, std::string const& other) {
+  TAnswer<TCIMValue> const left = view.Answer(instance, one), right = view.Answer(instance, other);
+  if (!left.IsKnown()) return Unknown(left);
+  if (!right.IsKnown()) return Unknown(right);
+  auto const leftNumber = NumberIn(left), rightNumber = NumberIn(right);
+  std::uint64_t bytes = 0;
+  if (!leftNumber || !rightNumber || __builtin_mul_overflow(*leftNumber, *rightNumber, &bytes))
+    return TCell::Unknown({kMissingUnexpected, one + " times " + other + " is not a size"}, left.fSource);
+  return TCell::Known(TextWithUnit(TCIMValue(bytes), "byte"), left.fSource);
+}
+
+TCell CellOf(TNamespaceView const& view, ICIMInstance const& instance, TColumn const& column) {
+  switch (column.fCell) {
+    case ECell::kIdentifier:
+      return IdentifierCell(view, instance, column.fOther);
+    case ECell::kProduct:
+      return ProductCell(view, instance, column.fProperty, column.fOther);
+    case ECell::kEither:
+      if (view.Answer(instance, column.fProperty).IsKnown()) break;
+      return PropertyCell(view, instance, column.fOther);
+    case ECell::kProperty:
+      break;
+  }
+  return PropertyCell(view, instance, column.fProperty);
+}
+
 // ---- Rows ----
 
 // Whether a row would have nothing but its name: some namespaces have an instance only for its associations.
@@ -156,9 +219,7 @@ bool IsEmptyRow(std::vector<TCell> const& row) {
 
 std::vector<TCell> RowOf(TNamespaceView const& view, ICIMInstance const& instance, TSubject const& subject) {
   std::vector<TCell> row;
-  for (TColumn const& column : subject.fColumns)
-    row.push_back(column.fKind == nullptr ? PropertyCell(view, instance, column.fProperty)
-                                          : IdentifierCell(view, instance, column.fKind));
+  for (TColumn const& column : subject.fColumns) row.push_back(CellOf(view, instance, column));
   return row;
 }
 

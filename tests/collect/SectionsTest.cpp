@@ -84,6 +84,41 @@ TEST_F(SectionsTest, AnIdentifierIsFoundByItsDescription) {
                                          "<the provider has no property StatusDescriptions>"));
 }
 
+TRecord Volume(std::string const& name, std::uint64_t blocks, std::uint64_t blockSize) {
+  TRecord record("CIM_StorageVolume", "sysfs");
+  record.AddKey("DeviceID", name);
+  record.Add("ElementName", TFinding<std::string>("data/" + name));
+  record.Add("NumberOfBlocks", TFinding<std::uint64_t>(blocks));
+  record.Add("BlockSize", TFinding<std::uint64_t>(blockSize)).Unit("byte");
+  record.Add("StatusDescriptions", TFinding<std::vector<std::string>>(std::vector<std::string>{"active"}));
+  return record;
+}
+
+TEST_F(SectionsTest, AVolumeHasASizeOfBlocks) {
+  fWriter.Write(Volume("", 0, 0), {Volume("dm-0", 2097152, 512), Volume("dm-1", UINT64_MAX, 512)}, {});
+  EXPECT_THAT(Rows("volumes"),
+              ElementsAre("dm-0|data/dm-0|1 GiB|active", "dm-1|data/dm-1|<NumberOfBlocks times BlockSize is not a size>|active"));
+}
+
+TRecord Route(std::string const& destination, TFinding<std::string> const& mask, TFinding<std::uint8_t> const& prefix) {
+  TRecord record("CIM_NextHopIPRoute", "rtnetlink");
+  record.AddKey("InstanceID", "route " + destination);
+  record.Add("DestinationAddress", TFinding<std::string>(destination));
+  record.Add("DestinationMask", mask);
+  record.Add("PrefixLength", prefix);
+  record.Add("InterfaceName", TFinding<std::string>("eth0"));
+  return record;
+}
+
+TEST_F(SectionsTest, ARouteHasAMaskOrAPrefix) {
+  TMissing const other{kMissingNotApplicable, "the route is of the other family"};
+  fWriter.Write(Route("", other, other),
+                {Route("192.0.2.0", std::string("255.255.255.0"), other), Route("fd00::", other, std::uint8_t(64))}, {});
+  std::string const missing = "<the provider has no property ";
+  std::string const end = missing + "Gateway>|eth0|" + missing + "Metric>|" + missing + "Protocol>";
+  EXPECT_THAT(Rows("routes"), ElementsAre("192.0.2.0|255.255.255.0|" + end, "fd00::|64|" + end));
+}
+
 TEST_F(SectionsTest, AnInstanceThatHasOnlyItsNameIsOmitted) {
   TRecord device("CIM_PCIDevice", "sysfs");
   device.AddKey("DeviceID", "0000:00:01.0");

@@ -33,7 +33,8 @@ std::size_t BreakOf(std::string_view text, std::size_t width) {
 
 // ---- Columns ----
 
-constexpr std::size_t kGap = 2;  // between two columns
+constexpr std::size_t kGap = 2;         // between two columns
+constexpr std::size_t kLeastWidth = 6;  // of a column whose words are broken
 
 using TWidths = std::vector<std::size_t>;
 
@@ -48,6 +49,17 @@ std::size_t LongestWordIn(std::string_view cell) {
   }
   return longest;
 }
+
+// A number and its unit, such as "11.8 GiB", which stay on one line.
+bool IsQuantity(std::string_view cell) {
+  constexpr std::size_t longest = 20;
+  constexpr char const* digits = "0123456789.";
+  std::size_t const end = cell.find_first_not_of(digits);
+  if (cell.size() > longest || end == 0 || end == cell.npos || cell[end] != ' ') return false;
+  return cell.find_first_of(digits, end) == cell.npos && cell.find(' ', end + 1) == cell.npos;
+}
+
+std::size_t LongestPartOf(std::string_view cell) { return IsQuantity(cell) ? WidthOf(cell) : LongestWordIn(cell); }
 
 std::size_t LineWidthOf(TWidths const& widths) {
   return std::accumulate(widths.begin(), widths.end(), kGap * (widths.size() - 1));
@@ -126,12 +138,13 @@ void TTable::Add(std::vector<std::string> const& cells) {
 }
 
 std::vector<std::size_t> TTable::WidthsFor(ELayout layout, std::size_t lineWidth) const {
-  TWidths needed(fWidths.size()), whole(fWidths.size());
+  TWidths needed(fWidths.size()), whole(fWidths.size()), least(fWidths.size(), kLeastWidth);
   for (auto const& row : fRows)
     for (std::size_t at = 0; at < row.size(); ++at) {
       // A word of more than three quarters of the line is cut instead.
-      std::size_t const longest = LongestWordIn(row[at]);
+      std::size_t const longest = LongestPartOf(row[at]);
       if (longest <= lineWidth / 4 * 3) needed[at] = std::max(needed[at], longest);
+      if (IsQuantity(row[at])) least[at] = std::max(least[at], longest);
       whole[at] = std::max(whole[at], WidthOf(row[at]));
     }
   if (layout == ELayout::kPlain) return whole;
@@ -139,6 +152,7 @@ std::vector<std::size_t> TTable::WidthsFor(ELayout layout, std::size_t lineWidth
   TWidths widths = fWidths;
   for (std::size_t at = 0; at < widths.size(); ++at) widths[at] = std::max(widths[at], needed[at]);
   Narrow(widths, needed, lineWidth);
+  Narrow(widths, least, lineWidth);
   if (layout == ELayout::kTerminal) Widen(widths, whole, lineWidth);
   return widths;
 }

@@ -27,8 +27,9 @@ std::string SizeText(std::uint64_t bytes);
 // An exact size, in the largest unit that divides it: "512 MiB", "1025 bytes".
 std::string ExactSizeText(std::uint64_t bytes);
 
-// A table with a title line and columns separated by two blanks. A cell that is too long for its column is wrapped; only a word
-// that is longer than three quarters of a line is broken. Cells are made printable (SafeText.h) by this class.
+// A table with a title line and columns separated by two blanks. A cell that is too long for its column is wrapped. A number with
+// its unit stays on one line; a word is broken only if it is longer than three quarters of a line, or if the words of all columns
+// do not fit on a line together: then those of the widest column. Cells are made printable (SafeText.h) by this class.
 class TTable {
 public:
   // `widths`: the widths of the columns on a line of 80, in characters.

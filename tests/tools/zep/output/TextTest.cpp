@@ -4,6 +4,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <sstream>
+#include <utility>
+
 namespace NQRVZEP20::zep {
 namespace {
 
@@ -67,6 +70,40 @@ TEST(TextTest, AWordThatFillsMostOfTheLineIsBroken) {
             "      1234567890\n"
             "c     1234567890  d\n"
             "      12345\n");
+}
+
+TEST(TextTest, AQuantityStaysOnOneLine) {
+  TTable table({10, 4, 4});
+  table.Add({"Name", "Size", "Free"});
+  table.Add({"/mnt/a/name", "11.8 GiB", "4 KiB"});
+  EXPECT_EQ(table.TextFor(ELayout::kFile, 80), "Name         Size      Free\n/mnt/a/name  11.8 GiB  4 KiB\n");
+  EXPECT_EQ(table.TextFor(ELayout::kFile, 24), "Name     Size      Free\n/mnt/a/  11.8 GiB  4 KiB\nname\n");
+}
+
+// The names of file systems are those of other people: long words, escapes, and texts of many characters.
+TEST(TextTest, HostileNamesBreakNeitherQuantitiesNorLines) {
+  std::vector<std::string> const names = {
+      std::string(300, 'x'),
+      "/mnt/sandboxing/model_tools_env/v1/python",
+      std::string(40, '\x1b'),
+      std::string(500, ' '),
+      "1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16 17 18 19 20 21 22 23 24 25 26 27 28 29 30 31 32 33 34 35 36 37 38 39 40",
+      "1 " + std::string(200, 'x'),
+      "<script>" + std::string(60, '\xff')};
+  TTable table({40, 8, 8, 7, 9});
+  table.Add({"File system", "Type", "Size", "Free", "Read-only"});
+  for (std::string const& name : names) table.Add({name, "squashfs", "1023.9 GiB", "11.8 GiB", "false"});
+
+  for (auto const& [layout, width] : {std::pair{ELayout::kTerminal, 60u}, std::pair{ELayout::kTerminal, 80u},
+                                      std::pair{ELayout::kTerminal, 120u}, std::pair{ELayout::kFile, 80u}}) {
+    std::istringstream lines(table.TextFor(layout, width));
+    std::size_t quantities = 0;
+    for (std::string line; std::getline(lines, line);) {
+      EXPECT_LE(WidthOf(line), width) << line;
+      if (line.find("1023.9 GiB  11.8 GiB  false") != line.npos) ++quantities;
+    }
+    EXPECT_EQ(quantities, names.size()) << "in a width of " << width;
+  }
 }
 
 TEST(TextTest, WideColumnsFillTheTerminal) {
