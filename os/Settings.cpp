@@ -10,7 +10,7 @@
 namespace NQRVZEP20 {
 namespace {
 
-std::size_t HashOf(std::string_view key) { return std::hash<std::string_view>()(key); }
+std::uint32_t HashOf(std::string_view key) { return static_cast<std::uint32_t>(std::hash<std::string_view>()(key)); }
 
 }  // namespace
 
@@ -40,11 +40,11 @@ std::vector<std::string> TSettings::Keys() const {
 }
 
 void TSettings::Insert(TSetting const& setting) {
-  std::size_t const hash = HashOf(setting.fKey);
+  std::uint32_t const hash = HashOf(setting.fKey);
   TPlace& place = fTable[PlaceOf(hash, setting.fKey)];
   if (place.fNumber != 0) return;
   fSettings.push_back(setting);
-  place = {hash, fSettings.size()};
+  place = {hash, static_cast<std::uint32_t>(fSettings.size())};
 }
 
 // Makes room for that many settings.
@@ -58,7 +58,7 @@ void TSettings::ResizeTable(std::size_t settings) {
 }
 
 // The place of a key, or the free one where it belongs.
-std::size_t TSettings::PlaceOf(std::size_t hash, std::string_view key) const {
+std::size_t TSettings::PlaceOf(std::uint32_t hash, std::string_view key) const {
   std::size_t const mask = fTable.size() - 1;
   std::size_t at = hash & mask;
   while (fTable[at].fNumber != 0 && (fTable[at].fHash != hash || fSettings[fTable[at].fNumber - 1].fKey != key))
