@@ -22,7 +22,7 @@ protected:
 // Contents of every kind and of sizes around those of one read.
 std::vector<std::string> Contents() {
   std::vector<std::string> contents = {"", "text", "two\nlines\n", std::string("zero\0byte", 9), "\xff\xfe\r\n"};
-  for (std::size_t const size : {4095u, 4096u, 4097u, 8192u, 131072u, 131073u, 1000000u}) {
+  for (std::size_t const size : {4095u, 4096u, 4097u, 8192u, 131072u, 131073u, 262145u, 1000000u, 20000001u}) {
     std::string text(size, ' ');
     for (std::size_t i = 0; i < size; ++i) text[i] = static_cast<char>(i * 31 + i / 256);
     contents.push_back(text);
