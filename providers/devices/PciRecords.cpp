@@ -2,8 +2,8 @@
 #include "PciRecords.h"
 
 #include "PciLink.h"
-#include "TIdentifiers.h"
 #include "ValueNames.h"
+#include "providers/reasons/TIdentifiers.h"
 
 #include <algorithm>
 #include <cstdio>

@@ -2,7 +2,7 @@
 #include "UsbRecords.h"
 
 #include "PciAddress.h"
-#include "TIdentifiers.h"
+#include "providers/reasons/TIdentifiers.h"
 
 #include <algorithm>
 #include <charconv>

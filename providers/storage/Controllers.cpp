@@ -2,6 +2,7 @@
 #include "Controllers.h"
 
 #include "ValueNames.h"
+#include "providers/reasons/TIdentifiers.h"
 
 #include <algorithm>
 #include <iterator>
@@ -12,7 +13,6 @@ namespace NQRVZEP20 {
 namespace {
 
 using TText = TFinding<std::string>;
-using TTexts = TFinding<std::vector<std::string>>;
 using TCode = TFinding<unsigned short>;
 
 std::string const kSlots = "/sys/bus/pci/slots/";
@@ -44,11 +44,12 @@ TText NumbersOf(TMachineFiles const& files, std::string const& path) {
   });
 }
 
-// The identifiers with their meanings.
-std::map<std::string, TText> IdentifiersOf(TMachineFiles const& files, std::string const& path) {
-  return {{"Driver", files.RealName(path + "/driver")},
-          {"Kernel module", files.RealName(path + "/driver/module")},
-          {"PCI vendor and device", NumbersOf(files, path)}};
+TIdentifiers IdentifiersOf(TMachineFiles const& files, std::string const& path) {
+  TIdentifiers identifiers;
+  identifiers.Add("Driver", files.RealName(path + "/driver"));
+  identifiers.Add("Kernel module", files.RealName(path + "/driver/module"));
+  identifiers.Add("PCI vendor and device", NumbersOf(files, path));
+  return identifiers;
 }
 
 // "0000:03:00" for each slot name.
@@ -57,11 +58,6 @@ std::map<std::string, std::string> SlotsByAddress(TMachineFiles const& files) {
   for (std::string const& name : files.Names(kSlots))
     if (TText const address = files.Line(kSlots + name + "/address")) slots.emplace(*address, name);
   return slots;
-}
-
-TTexts NotEmpty(std::vector<std::string> const& texts) {
-  if (texts.empty()) return TMissing{kMissingNotGiven, "sysfs shows neither a driver nor the numbers of the controller"};
-  return texts;
 }
 
 }  // namespace
@@ -81,18 +77,14 @@ std::vector<TController> ControllersOf(std::vector<TDisk> const& disks) {
 }
 
 TRecord ControllerRecord(TMachineFiles const& files, TController const& controller, TComputerSystem const& system) {
-  std::vector<std::string> values, meanings;
-  for (auto const& [meaning, value] : IdentifiersOf(files, controller.fPath)) {
-    if (!value) continue;
-    values.push_back(*value);
-    meanings.push_back(meaning);
-  }
+  TIdentifiers const identifiers = IdentifiersOf(files, controller.fPath);
+  TMissing const noIdentifier{kMissingNotGiven, "sysfs shows neither a driver nor the numbers of the controller"};
   TRecord record("CIM_PCIController", "sysfs");
   system.AddDeviceKeys(record, controller.fAddress);
   record.Add("ProtocolSupported", controller.fTransport.Then(ProtocolFrom)).Names(kProtocolSupportedNames);
   record.Add("ProtocolDescription", controller.fTransport);
-  record.Add("OtherIdentifyingInfo", NotEmpty(values));
-  record.Add("IdentifyingDescriptions", NotEmpty(meanings));
+  record.Add("OtherIdentifyingInfo", identifiers.Values(noIdentifier));
+  record.Add("IdentifyingDescriptions", identifiers.Descriptions(noIdentifier));
   return record;
 }
 

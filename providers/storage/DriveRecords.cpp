@@ -2,6 +2,7 @@
 #include "DriveRecords.h"
 
 #include "ValueNames.h"
+#include "providers/reasons/TIdentifiers.h"
 
 #include <algorithm>
 #include <iterator>
@@ -13,7 +14,6 @@ namespace NQRVZEP20 {
 namespace {
 
 using TText = TFinding<std::string>;
-using TTexts = TFinding<std::vector<std::string>>;
 using TCode = TFinding<unsigned short>;
 using TCodes = TFinding<std::vector<unsigned short>>;
 
@@ -65,30 +65,14 @@ TCode HealthStateOf(TFinding<bool> const& passed) {
   return passed.Then([](bool isHealthy) { return isHealthy ? kHealthy : kMajorFailure; });
 }
 
-// The identifiers of a drive with their meanings, for two parallel arrays.
-struct TIdentifiers {
-  std::vector<std::string> fValues, fMeanings;
-
-  void Add(TText const& value, std::string const& meaning) {
-    if (!value) return;
-    fValues.push_back(*value);
-    fMeanings.push_back(meaning);
-  }
-};
-
 TIdentifiers IdentifiersOf(TMachineFiles const& files, TDisk const& disk) {
   TIdentifiers identifiers;
-  for (TDesignator const& designator : disk.fDesignators) identifiers.Add(designator.fText, designator.fFormat);
-  identifiers.Add(disk.fSerialNumber, "Serial number");
-  identifiers.Add(disk.fAttachment.ScsiAddress(), "SCSI address");
-  identifiers.Add(files.Line(disk.fDevice.File("device/subsysnqn")), "NVMe qualified name");
-  identifiers.Add(files.RealName(disk.fDevice.File("device/driver")), "Driver");
+  for (TDesignator const& designator : disk.fDesignators) identifiers.Add(designator.fFormat, designator.fText);
+  identifiers.Add("Serial number", disk.fSerialNumber);
+  identifiers.Add("SCSI address", disk.fAttachment.ScsiAddress());
+  identifiers.Add("NVMe qualified name", files.Line(disk.fDevice.File("device/subsysnqn")));
+  identifiers.Add("Driver", files.RealName(disk.fDevice.File("device/driver")));
   return identifiers;
-}
-
-TTexts TextsFrom(std::vector<std::string> const& texts) {
-  if (texts.empty()) return TMissing{kMissingNotGiven, "neither the drive nor the kernel reports an identifier"};
-  return texts;
 }
 
 TCodes CapabilitiesOf(TMachineFiles const& files, TBlockDevice const& drive) {
@@ -159,13 +143,14 @@ TText OtherInterconnectOf(std::string const& transport) {
 TRecord AnyDriveRecord(char const* className, TMachineFiles const& files, TDisk const& disk, TFinding<TStatus> const& status,
                        TComputerSystem const& system) {
   TIdentifiers const identifiers = IdentifiersOf(files, disk);
+  TMissing const noIdentifier{kMissingNotGiven, "neither the drive nor the kernel reports an identifier"};
   TBlockDevice const& device = disk.fDevice;
   TRecord record(className, kSource);
   system.AddDeviceKeys(record, device.fName);
   record.Add("Name", TText(device.Node()));
   record.Add("ElementName", disk.fModel);
-  record.Add("OtherIdentifyingInfo", TextsFrom(identifiers.fValues));
-  record.Add("IdentifyingDescriptions", TextsFrom(identifiers.fMeanings));
+  record.Add("OtherIdentifyingInfo", identifiers.Values(noIdentifier));
+  record.Add("IdentifyingDescriptions", identifiers.Descriptions(noIdentifier));
   record.Add("OperationalStatus", status.Then([](TStatus const& values) { return values.fCodes; }))
       .Names(kOperationalStatusNames);
   record.Add("StatusDescriptions", status.Then([](TStatus const& values) { return values.fTexts; }));

@@ -174,8 +174,8 @@ TRecord RaidArrayRecord(TMachineFiles const& files, TRaidArray const& array, TUd
   TBlockDevice const& device = array.fDevice;
   TCode const redundancy = RedundancyOf(array);
   TText const uuid = UuidOf(files, array, udev);
-  TVolumeNames names;
-  names.Add(uuid, "RAID UUID");
+  TIdentifiers names;
+  names.Add("RAID UUID", uuid);
   TRecord record =
       VolumeRecord("ZEP_RaidArray", files, device, system, NameOf(array, udev), names, StatusOf(array), "CIM_StorageVolume");
   record.Add("ExtentStatus", ExtentStatusOf(array)).Names(kExtentStatusNames);

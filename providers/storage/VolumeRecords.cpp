@@ -20,16 +20,11 @@ TText MappedName(TMachineFiles const& files, TBlockDevice const& device) {
   });
 }
 
-TVolumeNames MappedNames(TMachineFiles const& files, TBlockDevice const& device) {
-  TVolumeNames names;
-  names.Add(files.Line(device.File("dm/name")), "Device mapper name");
-  names.Add(files.Line(device.File("dm/uuid")), "Device mapper UUID");
+TIdentifiers MappedNames(TMachineFiles const& files, TBlockDevice const& device) {
+  TIdentifiers names;
+  names.Add("Device mapper name", files.Line(device.File("dm/name")));
+  names.Add("Device mapper UUID", files.Line(device.File("dm/uuid")));
   return names;
-}
-
-TFinding<std::vector<std::string>> NotEmpty(std::vector<std::string> const& texts) {
-  if (texts.empty()) return TMissing{kMissingNotGiven, "the volume has no other name"};
-  return texts;
 }
 
 // The paths of a multipath device that cannot be used at present, and the number of all.
@@ -83,11 +78,12 @@ std::vector<std::string> DevicesBelow(TMachineFiles const& files, TBlockDevice c
 }
 
 TRecord VolumeRecord(char const* className, TMachineFiles const& files, TBlockDevice const& device, TComputerSystem const& system,
-                     TText const& elementName, TVolumeNames const& names, TFinding<TVolumeStatus> const& status,
+                     TText const& elementName, TIdentifiers const& names, TFinding<TVolumeStatus> const& status,
                      std::string const& superClass) {
   TRecord record = ExtentRecord(className, files, device, system, elementName, superClass);
-  record.Add("OtherIdentifyingInfo", NotEmpty(names.fValues));
-  record.Add("IdentifyingDescriptions", NotEmpty(names.fMeanings));
+  TMissing const noName{kMissingNotGiven, "the volume has no other name"};
+  record.Add("OtherIdentifyingInfo", names.Values(noName));
+  record.Add("IdentifyingDescriptions", names.Descriptions(noName));
   record.Add("OperationalStatus", status.Then([](TVolumeStatus const& state) { return state.fCodes; }))
       .Names(kOperationalStatusNames);
   record.Add("StatusDescriptions", status.Then([](TVolumeStatus const& state) { return state.fTexts; }));

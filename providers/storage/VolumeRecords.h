@@ -3,6 +3,7 @@
 
 #include "TBlockDevice.h"
 #include "providers/reasons/TComputerSystem.h"
+#include "providers/reasons/TIdentifiers.h"
 #include "providers/reasons/TRecord.h"
 
 #include <string>
@@ -23,20 +24,10 @@ struct TVolumeStatus {
   }
 };
 
-// Further names of a volume, and the meaning of each.
-struct TVolumeNames {
-  std::vector<std::string> fValues, fMeanings;
-
-  void Add(TFinding<std::string> const& value, char const* meaning) {
-    if (!value) return;
-    fValues.push_back(*value);
-    fMeanings.emplace_back(meaning);
-  }
-};
-
-// What volumes of all kinds have in common. `className`: CIM_StorageVolume, or one that has it as `superClass`.
+// What volumes of all kinds have in common. `className`: CIM_StorageVolume, or one that has it as `superClass`. `names`: its
+// further names.
 TRecord VolumeRecord(char const* className, TMachineFiles const& files, TBlockDevice const& device, TComputerSystem const& system,
-                     TFinding<std::string> const& elementName, TVolumeNames const& names, TFinding<TVolumeStatus> const& status,
+                     TFinding<std::string> const& elementName, TIdentifiers const& names, TFinding<TVolumeStatus> const& status,
                      std::string const& superClass = "");
 
 // A CIM_StorageVolume of the device mapper: an LVM volume, an encrypted device, a multipath device.
