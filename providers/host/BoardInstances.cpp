@@ -2,6 +2,7 @@
 #include "BoardInstances.h"
 
 #include "BoardRecords.h"
+#include "SmbiosFields.h"
 #include "providers/reasons/TRecordWriter.h"
 
 #include <algorithm>
@@ -13,6 +14,8 @@ namespace {
 constexpr TAssociation kSystemPackage{"CIM_ComputerSystemPackage", "Antecedent", "CIM_PhysicalPackage", "Dependent",
                                       "CIM_ComputerSystem"};
 constexpr TAssociation kMemoryOnCard{"CIM_MemoryOnCard", "GroupComponent", "CIM_Card", "PartComponent", "CIM_PhysicalMemory"};
+constexpr TAssociation kContainer{"CIM_Container", "GroupComponent", "CIM_PhysicalPackage", "PartComponent",
+                                  "CIM_PhysicalElement"};
 constexpr TAssociation kCapacity{"CIM_ElementCapacity", "Capacity", "CIM_PhysicalCapacity", "Element", "CIM_PhysicalElement"};
 
 using TRecords = std::vector<TStructureRecord>;
@@ -34,6 +37,18 @@ void TieMemory(THostContext const& host, TRecords const& boards, TRecords const&
   }
 }
 
+// A board names the handle of its chassis, and its place there.
+void TieChassis(THostContext const& host, TRecords const& boards, TRecords const& allChassis) {
+  constexpr std::size_t location = 0x0a, chassisHandle = 0x0b;  // of a board
+  for (TStructureRecord const& board : boards) {
+    TRecord place("CIM_Container", host.fTables.SourceOf(kSmbiosBoard));
+    place.Add("LocationWithinContainer", TextOf(board.fStructure, location));
+    for (TStructureRecord const& chassis : allChassis)
+      if (auto const handle = chassis.fStructure.Handle(); handle && IsNumber(board.fStructure.Word(chassisHandle), *handle))
+        host.fWriter.Associate(kContainer, chassis.fRecord, board.fRecord, place);
+  }
+}
+
 // Writes a class with a record of each structure of that type.
 template <class TMakeRecord>
 TRecords WriteAll(THostContext const& host, int type, TMakeRecord makeRecord) {
@@ -44,9 +59,11 @@ TRecords WriteAll(THostContext const& host, int type, TMakeRecord makeRecord) {
 
 }  // namespace
 
-void WriteBoards(THostContext const& host, std::vector<TStructureRecord> const& modules) {
+void WriteBoards(THostContext const& host, std::vector<TStructureRecord> const& chassis,
+                 std::vector<TStructureRecord> const& modules) {
   auto const boards = WriteAll(host, kSmbiosBoard, BoardRecord);
   for (TStructureRecord const& board : boards) host.fWriter.Associate(kSystemPackage, board.fRecord, host.fSystem);
+  TieChassis(host, boards, chassis);
   WriteAll(host, kSmbiosSlot, SlotRecord);
   TieMemory(host, boards, WriteAll(host, kSmbiosMemoryArray, MemoryArrayRecord), modules);
   WriteAll(host, kSmbiosOnboardDevice, OnboardDeviceRecord);

@@ -33,6 +33,16 @@ TFinding<std::uint16_t> RemovalFrom(std::uint8_t features) {
   return features & 0x0c ? whenOff : notApplicable;
 }
 
+// The bits for 5 and 3.3 volts, as numbers of CIM.
+TFinding<std::vector<unsigned short>> SlotVoltagesFrom(std::uint8_t characteristics) {
+  constexpr unsigned short at3Volts = 2, at5Volts = 3;
+  std::vector<unsigned short> voltages;
+  if (characteristics & 0x04) voltages.push_back(at3Volts);
+  if (characteristics & 0x02) voltages.push_back(at5Volts);
+  if (voltages.empty()) return Unknown();
+  return voltages;
+}
+
 // ---- Memory array ----
 
 constexpr char const* kLocations[] = {"system board", "ISA card",    "EISA card",        "PCI card",
@@ -142,6 +152,7 @@ TRecord SlotRecord(TSmbiosStructure const& slot, std::string const& source, unsi
   record.Add("MaxDataWidth", SlotDataWidthOf(slot)).Unit("bit");
   record.Add("MaxLinkWidth", SlotLinkWidthOf(slot)).Names(kMaxLinkWidthNames);
   record.Add("Description", SlotUsageOf(slot));
+  record.Add("VccMixedVoltageSupport", slot.Byte(0x0b).Then(SlotVoltagesFrom)).Names(kSlotVoltageNames);
   record.Add("SupportsHotPlug", FlagOf(slot.Byte(0x0c), 1));
   record.Add("OtherIdentifyingInfo", PciAddressOf(slot, 0x0d));
   return record;

@@ -46,6 +46,14 @@ TFinding<std::string> BootStatusFrom(std::uint8_t status) {
   return WordFor(status, words, 0, "boot status");
 }
 
+TFinding<std::string> WakeUpTypeFrom(std::uint8_t type) {
+  constexpr char const* words[] = {"APM Timer",    "Modem Ring", "LAN Remote",
+                                   "Power Switch", "PCI PME#",   "AC Power Restored"};  // from 3
+  if (type == 1) return std::string("Other");
+  if (type == 2) return Unknown();
+  return WordFor(type, words, 3, "wake-up type");
+}
+
 // A TPM 1.2 reports its version in the file caps: "TCG version: 1.2".
 TFinding<std::string> TpmVersionOf(TMachineFiles const& files, std::string const& directory) {
   auto const major = files.Line(directory + "tpm_version_major");
@@ -82,7 +90,7 @@ TRecord TpmRecord(TMachineFiles const& files, TSystemName const& name, std::stri
 
 }  // namespace
 
-TRecord BootRecord(TMachineFiles const& files, TSmbiosStructure const& status, std::string const& source) {
+TRecord BootRecord(TMachineFiles const& files, TSourcedStructure const& status, TSourcedStructure const& system) {
   TRecord record("ZEP_BootSettings", kSysfs, "CIM_SettingData");
   record.AddKey("InstanceID", "Boot");
   record.AddOwn("ElementName", "Boot");
@@ -92,8 +100,10 @@ TRecord BootRecord(TMachineFiles const& files, TSmbiosStructure const& status, s
   record.Add("SecureBootSetupMode", VariableOf(files, "SetupMode"));
   record.SetSource("/proc/cmdline");
   record.Add("KernelCommandLine", files.Line("/proc/cmdline"));
-  record.SetSource(source);
-  record.Add("FirmwareBootStatus", status.Byte(0x0a).Then(BootStatusFrom));
+  record.SetSource(status.fSource);
+  record.Add("FirmwareBootStatus", status.fStructure.Byte(0x0a).Then(BootStatusFrom));
+  record.SetSource(system.fSource);
+  record.Add("WakeUpType", system.fStructure.Byte(0x18).Then(WakeUpTypeFrom));
   return record;
 }
 

@@ -11,8 +11,13 @@
 
 namespace NQRVZEP20 {
 
-// How the machine was started (ZEP_BootSettings.mof). `status`: the structure of type 32, whose source is `source`.
-TRecord BootRecord(TMachineFiles const& files, TSmbiosStructure const& status, std::string const& source);
+struct TSourcedStructure {
+  TSmbiosStructure fStructure;
+  std::string fSource;
+};
+
+// How the machine was started (ZEP_BootSettings.mof). `status`: the structure of type 32. `system`: that of type 1.
+TRecord BootRecord(TMachineFiles const& files, TSourcedStructure const& status, TSourcedStructure const& system);
 
 // The trusted platform modules in /sys/class/tpm (ZEP_TrustedPlatformModule.mof).
 std::vector<TRecord> TpmRecords(TMachineFiles const& files, TSystemName const& name);

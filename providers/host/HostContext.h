@@ -5,13 +5,12 @@
 #include "TSystemName.h"
 #include "providers/reasons/TMachineFiles.h"
 #include "providers/reasons/TRecord.h"
+#include "providers/reasons/TRecordWriter.h"
 
 #include <string>
 #include <vector>
 
 namespace NQRVZEP20 {
-
-class TRecordWriter;
 
 // The sources and the writer that the steps share which fill the namespace. Each step writes the instances of one subject.
 struct THostContext {
@@ -22,6 +21,10 @@ struct THostContext {
   TSystemName fName;
   TRecord fSystem;  // the computer system, as written
 };
+
+constexpr TAssociation kSettings{"CIM_ElementSettingData", "ManagedElement", "CIM_ManagedElement", "SettingData",
+                                 "CIM_SettingData"};
+constexpr TAssociation kRealizes{"CIM_Realizes", "Antecedent", "CIM_PhysicalElement", "Dependent", "CIM_LogicalDevice"};
 
 // An SMBIOS structure and the record that was written for it.
 struct TStructureRecord {
@@ -54,6 +57,17 @@ std::vector<TStructureRecord> WriteEach(THostContext const& host, int type, TIsP
   TMissing const whyNone = WhyNonePresent(host.fTables, type, whyNonePresent);
   WriteRecords(host, makeRecord(TSmbiosStructure(whyNone), 0), records, whyNone);
   return records;
+}
+
+// Writes a class with the settings of each of these elements. `whyNone`: why there may be no element.
+template <class TMakeRecord>
+void WriteSettingsOf(THostContext const& host, std::vector<TStructureRecord> const& elements, TMissing const& whyNone,
+                     TMakeRecord makeRecord) {
+  std::vector<TRecord> settings;
+  for (TStructureRecord const& element : elements)
+    settings.push_back(makeRecord(element.fStructure, static_cast<unsigned>(settings.size())));
+  host.fWriter.Write(makeRecord(TSmbiosStructure(whyNone), 0), settings, whyNone);
+  for (std::size_t at = 0; at < settings.size(); ++at) host.fWriter.Associate(kSettings, elements[at].fRecord, settings[at]);
 }
 
 inline bool IsAlwaysPresent(TSmbiosStructure const&) { return true; }

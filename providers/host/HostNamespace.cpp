@@ -3,6 +3,7 @@
 
 #include "BoardInstances.h"
 #include "BootRecords.h"
+#include "FirmwareRecords.h"
 #include "HostContext.h"
 #include "HostRecords.h"
 #include "MemoryInstances.h"
@@ -24,8 +25,6 @@ constexpr TAssociation kSystemBios{"CIM_SystemBIOS", "GroupComponent", "CIM_Comp
 constexpr TAssociation kSystemPackage{"CIM_ComputerSystemPackage", "Antecedent", "CIM_PhysicalPackage", "Dependent",
                                       "CIM_ComputerSystem"};
 
-constexpr TAssociation kSettings{"CIM_ElementSettingData", "ManagedElement", "CIM_ManagedElement", "SettingData",
-                                 "CIM_SettingData"};
 constexpr TAssociation kStatistics{"CIM_ElementStatisticalData", "ManagedElement", "CIM_ManagedElement", "Stats",
                                    "CIM_StatisticalData"};
 
@@ -67,14 +66,23 @@ void WriteBios(THostContext const& host) {
     return BiosRecord(bios, host.fTables.SourceOf(kSmbiosBios), number);
   });
   for (TStructureRecord const& bios : records) host.fWriter.Associate(kSystemBios, host.fSystem, bios.fRecord);
+  WriteSettingsOf(host, records, WhyNonePresent(host.fTables, kSmbiosBios, ""),
+                  [&](TSmbiosStructure const& bios, unsigned number) {
+                    return FirmwareSettingsRecord(bios, host.fTables.SourceOf(kSmbiosBios), number);
+                  });
 }
 
-void WriteChassis(THostContext const& host) {
+std::vector<TStructureRecord> WriteChassis(THostContext const& host) {
   auto const records =
       WriteEach(host, kSmbiosChassis, IsAlwaysPresent, "", [&](TSmbiosStructure const& chassis, unsigned number) {
         return ChassisRecord(chassis, host.fTables.SourceOf(kSmbiosChassis), number);
       });
   for (TStructureRecord const& chassis : records) host.fWriter.Associate(kSystemPackage, chassis.fRecord, host.fSystem);
+  WriteSettingsOf(host, records, WhyNonePresent(host.fTables, kSmbiosChassis, ""),
+                  [&](TSmbiosStructure const& chassis, unsigned number) {
+                    return ChassisStateRecord(chassis, host.fTables.SourceOf(kSmbiosChassis), number);
+                  });
+  return records;
 }
 
 // Writes an instance with the settings of the computer system; none when the hardware is that of another machine.
@@ -89,7 +97,8 @@ void WriteSettings(THostContext const& host, TMakeRecord makeRecord) {
 
 void WriteFirmware(THostContext const& host, TFinding<TKernelProcessors> const& processors) {
   WriteSettings(host, [&](TMachineFiles const& files) {
-    return BootRecord(files, host.fTables.First(kSmbiosBoot), host.fTables.SourceOf(kSmbiosBoot));
+    return BootRecord(files, {host.fTables.First(kSmbiosBoot), host.fTables.SourceOf(kSmbiosBoot)},
+                      {host.fTables.First(kSmbiosSystem), host.fTables.SourceOf(kSmbiosSystem)});
   });
   WriteSettings(host, [&](TMachineFiles const& files) { return VirtualizationRecord(files, processors); });
 
@@ -124,9 +133,9 @@ void FillHostNamespace(TMemoryNamespace& ns) {
   WriteOperatingSystem(host, kernel);
   writer.Write(ProductRecord());
   WriteBios(host);
-  WriteChassis(host);
+  auto const chassis = WriteChassis(host);
   auto const processors = WriteProcessors(host);
-  WriteBoards(host, WriteMemory(host, processors));
+  WriteBoards(host, chassis, WriteMemory(host, processors));
   WriteFirmware(host, processors.fKernel);
   WriteScsiDevices(host);
   writer.WriteMissing();

@@ -2,6 +2,7 @@
 #include "MemoryInstances.h"
 
 #include "CacheRecords.h"
+#include "FirmwareRecords.h"
 #include "MemoryTotals.h"
 #include "NumaRecords.h"
 #include "ProcessorInstances.h"
@@ -19,7 +20,8 @@ namespace {
 constexpr TAssociation kCacheMemory{"CIM_AssociatedCacheMemory", "Antecedent", "CIM_Memory", "Dependent", "CIM_LogicalElement"};
 constexpr TAssociation kProcessorMemory{"CIM_AssociatedProcessorMemory", "Antecedent", "CIM_Memory", "Dependent",
                                         "CIM_Processor"};
-constexpr TAssociation kRealizes{"CIM_Realizes", "Antecedent", "CIM_PhysicalElement", "Dependent", "CIM_LogicalDevice"};
+
+constexpr char const* kNoneFilled = "the firmware reports every memory slot as empty";
 
 // The socket and the core of each CPU.
 using TPlaces = std::map<unsigned, std::pair<std::size_t, std::size_t>>;
@@ -79,6 +81,23 @@ void WriteNodes(THostContext const& host, TPlaces const& places, TProcessorInsta
   }
 }
 
+// The structure of the memory array to which a module belongs.
+TSmbiosStructure ArrayOf(TSmbiosStructure const& module, TSmbiosReader const& tables) {
+  auto const arrayHandle = module.Word(0x04);
+  for (TSmbiosStructure const& array : tables.All(kSmbiosMemoryArray))
+    if (auto const handle = array.Handle(); arrayHandle && handle && *handle == *arrayHandle) return array;
+  return TSmbiosStructure(arrayHandle ? TMissing{kMissingNotGiven, "the SMBIOS tables contain no array with the module's handle"}
+                                      : arrayHandle.Why());
+}
+
+void WriteModuleSettings(THostContext const& host, std::vector<TStructureRecord> const& modules) {
+  WriteSettingsOf(host, modules, WhyNonePresent(host.fTables, kSmbiosMemoryDevice, kNoneFilled),
+                  [&](TSmbiosStructure const& module, unsigned number) {
+                    return ModuleSettingsRecord(module, ArrayOf(module, host.fTables), host.fTables.SourceOf(kSmbiosMemoryDevice),
+                                                number);
+                  });
+}
+
 // The main memory and the caches, which are of one class. Returns the record of the main memory, if it is known.
 std::optional<TRecord> WriteMemories(THostContext const& host, TPlaces const& places, TProcessorInstances const& processors) {
   auto const& files = host.fHardwareFiles;
@@ -98,10 +117,11 @@ std::optional<TRecord> WriteMemories(THostContext const& host, TPlaces const& pl
 
 std::vector<TStructureRecord> WriteMemory(THostContext const& host, TProcessorInstances const& processors) {
   TPlaces const places = processors.fKernel ? PlacesOf(*processors.fKernel) : TPlaces();
-  auto const modules = WriteEach(host, kSmbiosMemoryDevice, IsSlotFilled, "the firmware reports every memory slot as empty",
-                                 [&](TSmbiosStructure const& memoryDevice, unsigned number) {
-                                   return MemoryRecord(memoryDevice, host.fTables.SourceOf(kSmbiosMemoryDevice), number);
-                                 });
+  auto const modules =
+      WriteEach(host, kSmbiosMemoryDevice, IsSlotFilled, kNoneFilled, [&](TSmbiosStructure const& memoryDevice, unsigned number) {
+        return MemoryRecord(memoryDevice, host.fTables.SourceOf(kSmbiosMemoryDevice), number);
+      });
+  WriteModuleSettings(host, modules);
   auto const mainMemory = WriteMemories(host, places, processors);
   if (mainMemory)
     for (TStructureRecord const& module : modules) host.fWriter.Associate(kRealizes, module.fRecord, *mainMemory);

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "ProcessorInstances.h"
 
+#include "FirmwareRecords.h"
 #include "ProcessorRecords.h"
 #include "WeaknessRecords.h"
 #include "providers/reasons/TRecordWriter.h"
@@ -13,10 +14,10 @@ namespace {
 
 constexpr TAssociation kCapabilities{"CIM_ElementCapabilities", "ManagedElement", "CIM_ManagedElement", "Capabilities",
                                      "CIM_Capabilities"};
-constexpr TAssociation kSettings{"CIM_ElementSettingData", "ManagedElement", "CIM_ManagedElement", "SettingData",
-                                 "CIM_SettingData"};
 constexpr TAssociation kComponent{"CIM_ConcreteComponent", "GroupComponent", "CIM_ManagedElement", "PartComponent",
                                   "CIM_ManagedElement"};
+
+constexpr char const* kNoneFilled = "the firmware reports every processor socket as empty";
 
 using TSockets = std::vector<TKernelProcessors::TSocket>;
 
@@ -46,7 +47,7 @@ std::vector<TFinding<TProcessorFacts>> FactsOf(TFinding<TKernelProcessors> const
 void WriteProcessorRecords(THostContext const& host, TProcessorInstances& instances) {
   auto const filled = FilledSockets(host.fTables);
   auto const facts = FactsOf(instances.fKernel, host.fFiles, filled.size());
-  TMissing const whyNone = WhyNonePresent(host.fTables, kSmbiosProcessor, "the firmware reports every processor socket as empty");
+  TMissing const whyNone = WhyNonePresent(host.fTables, kSmbiosProcessor, kNoneFilled);
   auto const recordOf = [&](unsigned number, TFinding<TProcessorFacts> const& kernel) {
     TSmbiosStructure const structure = number < filled.size() ? filled[number] : TSmbiosStructure(whyNone);
     return ProcessorRecord(structure, host.fTables.SourceOf(kSmbiosProcessor), number, host.fName, kernel);
@@ -66,6 +67,18 @@ void WriteProcessorRecords(THostContext const& host, TProcessorInstances& instan
                      WhyNoKernelSocket(instances.fKernel));
   for (std::size_t at = 0; at < capabilities.size(); ++at)
     host.fWriter.Associate(kCapabilities, instances.fProcessors[at], capabilities[at]);
+}
+
+// The chips that the firmware lists in the sockets, which are matched with the processors in their order.
+void WriteChips(THostContext const& host, TProcessorInstances const& instances) {
+  auto const filled = FilledSockets(host.fTables);
+  std::string const source = host.fTables.SourceOf(kSmbiosProcessor);
+  TMissing const whyNone = WhyNonePresent(host.fTables, kSmbiosProcessor, kNoneFilled);
+  std::vector<TRecord> chips;
+  for (TSmbiosStructure const& structure : filled)
+    chips.push_back(ProcessorChipRecord(structure, source, static_cast<unsigned>(chips.size())));
+  host.fWriter.Write(ProcessorChipRecord(TSmbiosStructure(whyNone), source, 0), chips, whyNone);
+  for (std::size_t at = 0; at < chips.size(); ++at) host.fWriter.Associate(kRealizes, chips[at], instances.fProcessors[at]);
 }
 
 void WriteSettings(THostContext const& host, TProcessorInstances const& instances) {
@@ -103,6 +116,7 @@ void WriteWeaknesses(THostContext const& host) {
 TProcessorInstances WriteProcessors(THostContext const& host) {
   TProcessorInstances instances{host.fHardwareFiles.Then(TKernelProcessors::ReadFrom), {}, {}};
   WriteProcessorRecords(host, instances);
+  WriteChips(host, instances);
   WriteSettings(host, instances);
   WriteCores(host, instances);
   WriteWeaknesses(host);

@@ -214,6 +214,7 @@ constexpr TValueName kArrayMemoryTypeNames[] = {{"0", "Unknown"},
                                                 {"32568..65535", "Vendor Reserved"}};
 constexpr TValueName kRemovalConditionsNames[] = {
     {"0", "Unknown"}, {"2", "Not Applicable"}, {"3", "Removable when off"}, {"4", "Removable when on or off"}};
+constexpr TValueName kSlotVoltageNames[] = {{"0", "Unknown"}, {"1", "Other"}, {"2", "3.3V"}, {"3", "5V"}};
 constexpr TValueName kMaxLinkWidthNames[] = {{"0", "Unknown"}, {"2", "x1"},  {"3", "x2"},
                                              {"4", "x4"},      {"5", "x8"},  {"6", "x12"},
                                              {"7", "x16"},     {"8", "x32"}, {"9..", "DMTF Reserved"}};

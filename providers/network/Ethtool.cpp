@@ -88,15 +88,29 @@ TFinding<bool> DuplexFrom(TSettings const& settings) {
   return settings.fDuplex == DUPLEX_FULL;
 }
 
-// The three masks follow the structure: supported, advertised and of the partner.
-TFinding<std::vector<TLinkMode>> ModesIn(std::string const& answer, unsigned number) {
-  return SettingsIn(answer).Then([&](TSettings const& settings) -> TFinding<std::vector<TLinkMode>> {
+// A mask of the three that follow the structure: supported, advertised and of the partner.
+TFinding<std::string> MaskIn(std::string const& answer, unsigned number) {
+  return SettingsIn(answer).Then([&](TSettings const& settings) -> TFinding<std::string> {
     std::size_t const size = 4 * static_cast<std::size_t>(std::max(settings.fMaskWords, 0));
     std::size_t const begin = sizeof(ethtool_link_settings) + number * size;
     if (size == 0 || answer.size() < begin + size) return WhyUnknown("the link modes");
-    auto modes = LinkModesIn(std::string_view(answer).substr(begin, size));
+    return answer.substr(begin, size);
+  });
+}
+
+TFinding<std::vector<TLinkMode>> ModesIn(std::string const& answer, unsigned number) {
+  return MaskIn(answer, number).Then([](std::string const& mask) -> TFinding<std::vector<TLinkMode>> {
+    auto modes = LinkModesIn(mask);
     if (modes.empty()) return TMissing{kMissingNotGiven, "the driver reports no link mode"};
     return modes;
+  });
+}
+
+TFinding<std::vector<std::string>> FeaturesIn(std::string const& answer, unsigned number) {
+  return MaskIn(answer, number).Then([](std::string const& mask) -> TFinding<std::vector<std::string>> {
+    auto features = LinkFeaturesIn(mask);
+    if (features.empty()) return TMissing{kMissingNotGiven, "the driver reports no such feature"};
+    return features;
   });
 }
 
@@ -167,7 +181,9 @@ TLinkSettings::TLinkSettings(TFinding<std::string> const& answer)
       fConnector(TMissing()),
       fSupported(answer.Then([](std::string const& bytes) { return ModesIn(bytes, 0); })),
       fAdvertised(answer.Then([](std::string const& bytes) { return ModesIn(bytes, 1); })),
-      fOfPartner(answer.Then([](std::string const& bytes) { return ModesIn(bytes, 2); })) {
+      fOfPartner(answer.Then([](std::string const& bytes) { return ModesIn(bytes, 2); })),
+      fSupportedFeatures(answer.Then([](std::string const& bytes) { return FeaturesIn(bytes, 0); })),
+      fAdvertisedFeatures(answer.Then([](std::string const& bytes) { return FeaturesIn(bytes, 1); })) {
   auto const settings = answer.Then(SettingsIn);
   fSpeed = settings.Then(SpeedFrom);
   fIsFullDuplex = settings.Then(DuplexFrom);

@@ -28,6 +28,7 @@ struct TLinkSettings {
   TFinding<bool> fIsAutonegotiating;
   TFinding<std::string> fConnector;  // "Twisted Pair", …
   TFinding<std::vector<TLinkMode>> fSupported, fAdvertised, fOfPartner;
+  TFinding<std::vector<std::string>> fSupportedFeatures, fAdvertisedFeatures;  // "Autoneg", "TP", "Pause", …
 };
 
 struct TWakeOnLan {

@@ -125,19 +125,32 @@ constexpr TPortType kPortTypes[] = {
     {"40000baseSR4/", 202}, {"40000baseLR4/", 204}, {"100000baseKR4/", 304}, {"100000baseCR4/", 305},
 };
 
+// The names of the bits that are set.
+std::vector<std::string> NamesIn(std::string_view mask) {
+  std::vector<std::string> names;
+  for (std::size_t bit = 0; bit < std::size(kModes) && (bit / 32 + 1) * 4 <= mask.size(); ++bit) {
+    std::uint32_t word;
+    std::memcpy(&word, mask.data() + bit / 32 * 4, sizeof word);
+    if (word >> (bit % 32) & 1) names.emplace_back(kModes[bit]);
+  }
+  return names;
+}
+
 }  // namespace
 
 std::vector<TLinkMode> LinkModesIn(std::string_view mask) {
   std::vector<TLinkMode> modes;
-  for (std::size_t bit = 0; bit < std::size(kModes) && (bit / 32 + 1) * 4 <= mask.size(); ++bit) {
-    std::uint32_t word;
-    std::memcpy(&word, mask.data() + bit / 32 * 4, sizeof word);
-    std::string const name = kModes[bit];
-    std::size_t const slash = name.find('/');
-    if ((word >> (bit % 32) & 1) == 0 || slash == std::string::npos) continue;
-    modes.push_back({name, std::strtoull(name.c_str(), nullptr, 10) * 1'000'000, name.substr(slash) == "/Full"});
-  }
+  for (std::string const& name : NamesIn(mask))
+    if (std::size_t const slash = name.find('/'); slash != std::string::npos)
+      modes.push_back({name, std::strtoull(name.c_str(), nullptr, 10) * 1'000'000, name.substr(slash) == "/Full"});
   return modes;
+}
+
+std::vector<std::string> LinkFeaturesIn(std::string_view mask) {
+  std::vector<std::string> features;
+  for (std::string const& name : NamesIn(mask))
+    if (name.find('/') == std::string::npos) features.push_back(name);
+  return features;
 }
 
 std::uint16_t PortTypeOf(TLinkMode const& mode) {

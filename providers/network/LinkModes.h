@@ -22,6 +22,9 @@ struct TLinkMode {
 // The modes of transmission in a mask, in the order of the bits. A bit that this table does not know is ignored.
 std::vector<TLinkMode> LinkModesIn(std::string_view mask);
 
+// The names of the other bits in a mask: "Autoneg", "TP", "Pause", "FEC_RS".
+std::vector<std::string> LinkFeaturesIn(std::string_view mask);
+
 // The value of CIM_EthernetPort.PortType for the mode; 0 if the schema has none.
 std::uint16_t PortTypeOf(TLinkMode const& mode);
 

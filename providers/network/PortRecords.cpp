@@ -153,6 +153,8 @@ TRecord CapabilitiesRecord(TPort const& port) {
   record.Add("SupportedLinkModes", NamesOf(port.fSettings.fSupported));
   record.Add("AdvertisedLinkModes", NamesOf(port.fSettings.fAdvertised));
   record.Add("PartnerLinkModes", NamesOf(port.fSettings.fOfPartner));
+  record.Add("SupportedFeatures", port.fSettings.fSupportedFeatures);
+  record.Add("AdvertisedFeatures", port.fSettings.fAdvertisedFeatures);
   record.Add("Connector", port.fSettings.fConnector);
   return record;
 }

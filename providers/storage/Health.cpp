@@ -100,6 +100,7 @@ TRecord AttributeRecord(std::string const& disk, TSmartAttribute const& attribut
   record.Add("Threshold", attribute.fThreshold);
   record.Add("RawValue", attribute.fRaw);
   record.Add("RawText", attribute.fRawText);
+  record.Add("IsPrefailure", attribute.fIsPrefailure);
   record.Add("WhenFailed", attribute.fWhenFailed);
   return record;
 }

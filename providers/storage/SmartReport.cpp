@@ -86,6 +86,7 @@ std::vector<TSmartAttribute> AttributesFrom(TJson const& json) {
     attribute.fThreshold = Number<unsigned short>(At(row, "thresh"));
     attribute.fRaw = Number<unsigned long>(At(row, "raw/value"));
     attribute.fRawText = Text(At(row, "raw/string"));
+    attribute.fIsPrefailure = Flag(At(row, "flags/prefailure"));
     TText const whenFailed = Text(At(row, "when_failed"));
     attribute.fWhenFailed = whenFailed ? whenFailed : TMissing{kMissingNotApplicable, "the attribute has never failed"};
     attributes.push_back(attribute);

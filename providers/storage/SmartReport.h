@@ -14,6 +14,7 @@ struct TSmartAttribute {
   TFinding<std::string> fName = TMissing();
   TFinding<unsigned short> fValue = TMissing(), fWorst = TMissing(), fThreshold = TMissing();
   TFinding<unsigned long> fRaw = TMissing();
+  TFinding<bool> fIsPrefailure = TMissing();
   TFinding<std::string> fRawText = TMissing();     // as smartctl interprets the raw value
   TFinding<std::string> fWhenFailed = TMissing();  // "now" or "past"
 };

@@ -138,12 +138,12 @@ TEST(BoardRecordsTest, NothingIsReadOutsideAStructure) {
            OnboardDeviceRecord(structure, "", 0).GetProperties().size() +
            IpmiRecord(structure, "", 0, TSystemName{"db1", "uname"}).GetProperties().size();
   };
-  for (std::size_t length = 0; length <= seed.size(); ++length) EXPECT_EQ(read(seed.substr(0, length)), 44u) << length;
+  for (std::size_t length = 0; length <= seed.size(); ++length) EXPECT_EQ(read(seed.substr(0, length)), 45u) << length;
   for (std::size_t at = 0; at < seed.size(); ++at)
     for (int byte : {0x00, 0x01, 0x7f, 0x80, 0xff}) {
       std::string changed = seed;
       changed[at] = static_cast<char>(byte);
-      EXPECT_EQ(read(changed), 44u) << at;
+      EXPECT_EQ(read(changed), 45u) << at;
     }
 }
 

@@ -13,7 +13,7 @@ namespace {
 class BootRecordsTest : public testing::Test {
 protected:
   std::string Boot(char const* property) {
-    return PropertyOf(BootRecord(TMachineFiles(fRoot.Path()), fStatus, "SMBIOS type 32"), property);
+    return PropertyOf(BootRecord(TMachineFiles(fRoot.Path()), {fStatus, "SMBIOS type 32"}, {fSystem, "SMBIOS type 1"}), property);
   }
   void Variable(std::string const& name, std::string const& bytes) {
     std::string const directory = fRoot.Path() + "/sys/firmware/efi/efivars/";
@@ -24,6 +24,7 @@ protected:
   TTempDir fRoot;
   TKernelTree fTree{fRoot.Path()};
   TSmbiosStructure fStatus = TStructureMaker(32, 0x0b).Byte(0x0a, 8).Make();
+  TSmbiosStructure fSystem = TStructureMaker(1, 0x1b).Byte(0x18, 6).Make();
 };
 
 TEST_F(BootRecordsTest, SecureBootIsAVariableOfTheFirmware) {
@@ -54,6 +55,12 @@ TEST_F(BootRecordsTest, TheCommandLineAndTheStatusAreThoseOfTheStart) {
   EXPECT_EQ(Boot("FirmwareBootStatus"), "string Product-specific status 200");
   fStatus = TStructureMaker(32, 0x0b).Byte(0x0a, 9).Make();
   EXPECT_EQ(Boot("FirmwareBootStatus"), "string NULL unexpected-form: not in the expected form: boot status 9");
+}
+
+TEST_F(BootRecordsTest, TheWakeUpTypeIsAWordOfTheStandard) {
+  EXPECT_EQ(Boot("WakeUpType"), "string Power Switch");
+  fSystem = TStructureMaker(1, 0x1b).Byte(0x18, 2).Make();
+  EXPECT_EQ(Boot("WakeUpType"), "string NULL not-given: the firmware reports it as unknown");
 }
 
 TEST_F(BootRecordsTest, ATpmHasItsVersionAndItsBanks) {

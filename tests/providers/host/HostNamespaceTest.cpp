@@ -37,6 +37,7 @@ namespace NQRVZEP20 {
 namespace {
 
 using testing::ElementsAre;
+using testing::ElementsAreArray;
 using testing::IsEmpty;
 using testing::UnorderedElementsAre;
 
@@ -194,13 +195,42 @@ TEST_F(HostNamespaceTest, ClassesHaveAFixedOrder) {
         return true;
       },
       TCIMContext());
-  EXPECT_THAT(names, ElementsAre("QRVSG_ComputerSystem", "CIM_Processor", "CIM_Memory", "ZEP_NUMANode", "ZEP_IPMIInterface",
-                                 "ZEP_TrustedPlatformModule", "QRVSG_SCSIDevice", "QRVSG_OperatingSystem", "CIM_ProcessorCore",
-                                 "CIM_BIOSElement", "CIM_Chassis", "CIM_Card", "CIM_PhysicalMemory", "ZEP_OnboardDevice",
-                                 "CIM_Slot", "ZEP_RunningState", "CIM_ProcessorCapabilities", "ZEP_ProcessorSettings",
-                                 "ZEP_BootSettings", "ZEP_Virtualization", "ZEP_ProcessorWeakness", "CIM_MemoryCapacity",
-                                 "CIM_RunningOS", "CIM_ComputerSystemPackage", "CIM_ElementStatisticalData", "QRVSG_ZEPProduct",
-                                 "CIM_SystemBIOS", "CIM_SystemDevice", "ZEP_MissingValue"));
+  EXPECT_THAT(names, ElementsAreArray({"QRVSG_ComputerSystem",
+                                       "CIM_Processor",
+                                       "CIM_Memory",
+                                       "ZEP_NUMANode",
+                                       "ZEP_IPMIInterface",
+                                       "ZEP_TrustedPlatformModule",
+                                       "QRVSG_SCSIDevice",
+                                       "QRVSG_OperatingSystem",
+                                       "CIM_ProcessorCore",
+                                       "CIM_BIOSElement",
+                                       "CIM_Chassis",
+                                       "CIM_Card",
+                                       "ZEP_ProcessorChip",
+                                       "CIM_PhysicalMemory",
+                                       "ZEP_OnboardDevice",
+                                       "CIM_Slot",
+                                       "ZEP_RunningState",
+                                       "ZEP_FirmwareSettings",
+                                       "ZEP_ChassisState",
+                                       "ZEP_ProcessorSettings",
+                                       "ZEP_MemoryModuleSettings",
+                                       "ZEP_BootSettings",
+                                       "ZEP_Virtualization",
+                                       "CIM_ProcessorCapabilities",
+                                       "ZEP_ProcessorWeakness",
+                                       "CIM_MemoryCapacity",
+                                       "CIM_RunningOS",
+                                       "CIM_ComputerSystemPackage",
+                                       "CIM_Realizes",
+                                       "CIM_ElementStatisticalData",
+                                       "QRVSG_ZEPProduct",
+                                       "CIM_SystemBIOS",
+                                       "CIM_SystemDevice",
+                                       "CIM_Container",
+                                       "CIM_ElementSettingData",
+                                       "ZEP_MissingValue"}));
 }
 
 TEST_F(HostNamespaceTest, ADeclarationHasKeyTypeAndSource) {
@@ -234,8 +264,8 @@ TEST_F(HostNamespaceTest, EveryInstanceIsFoundByItsPath) {
         return true;
       },
       TCIMContext());
-  // 9 of which there is one each, 2 processors, 8 modules, 6 slots, and 4 onboard devices
-  EXPECT_EQ(found, static_cast<int>(29 + InstancesOf("ZEP_MissingValue").size()));
+  // 11 of which there is one each, 2 processors and their chips, 8 modules and their settings, 6 slots, and 4 onboard devices
+  EXPECT_EQ(found, static_cast<int>(41 + InstancesOf("ZEP_MissingValue").size()));
 }
 
 TEST_F(HostNamespaceTest, EachMissingValueOfAnInstanceHasAReason) {
@@ -253,7 +283,8 @@ TEST_F(HostNamespaceTest, NothingIsNullWithoutAReason) {
     FillFromFile(RealTablePath(table));
     int nulls = 0;
     for (char const* className : {"QRVSG_ComputerSystem", "QRVSG_OperatingSystem", "QRVSG_ZEPProduct", "CIM_BIOSElement",
-                                  "CIM_Chassis", "CIM_Processor", "CIM_PhysicalMemory", "CIM_MemoryCapacity", "ZEP_RunningState"})
+                                  "CIM_Chassis", "CIM_Processor", "CIM_PhysicalMemory", "CIM_MemoryCapacity", "ZEP_RunningState",
+                                  "ZEP_FirmwareSettings", "ZEP_ChassisState", "ZEP_MemoryModuleSettings", "ZEP_ProcessorChip"})
       for (auto const& instance : InstancesOf(className))
         instance->EnumerateProperties(
             [&](boost::shared_ptr<ICIMProperty> property) {

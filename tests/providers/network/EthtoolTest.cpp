@@ -32,6 +32,10 @@ TEST(EthtoolTest, LinkSettingsAreThoseOfTheDriver) {
   EXPECT_EQ(settings.fSupported->size(), 5u);
   EXPECT_EQ(settings.fAdvertised->at(0).fName, "1000baseT/Full");
   EXPECT_EQ(settings.fOfPartner->at(0).fName, "100baseT/Full");
+  EXPECT_EQ(settings.fSupportedFeatures.Why().fReason, "the driver reports no such feature");
+  TLinkSettings const withFeatures(SettingsBytes(1000, DUPLEX_FULL, PORT_TP, 1, {0xe0, 0x2060, 0}));
+  EXPECT_EQ(*withFeatures.fSupportedFeatures, (std::vector<std::string>{"Autoneg", "TP"}));
+  EXPECT_EQ(*withFeatures.fAdvertisedFeatures, (std::vector<std::string>{"Autoneg", "Pause"}));
 }
 
 TEST(EthtoolTest, UnknownSettingsAreMissing) {

@@ -31,6 +31,11 @@ TEST(LinkModesTest, ModesHaveTheNamesOfEthtool) {
   EXPECT_THAT(NamesIn(MaskOf({102, 127}, 4)), IsEmpty()) << "unknown";
 }
 
+TEST(LinkModesTest, OtherBitsAreFeatures) {
+  EXPECT_THAT(LinkFeaturesIn(MaskOf({5, 6, 7, 13, 50, 64}, 4)), ElementsAre("Autoneg", "TP", "Pause", "FEC_RS"));
+  EXPECT_THAT(LinkFeaturesIn(MaskOf({0, 102}, 4)), IsEmpty());
+}
+
 TEST(LinkModesTest, ShortMasksAreRead) {
   std::string const mask = MaskOf({0, 5}, 1);
   for (std::size_t size = 0; size < 4; ++size) EXPECT_THAT(NamesIn(mask.substr(0, size)), IsEmpty());

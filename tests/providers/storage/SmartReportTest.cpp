@@ -33,6 +33,7 @@ TEST(SmartReportTest, AtaDisk) {
   EXPECT_EQ(TextOf(first.fThreshold), "6");
   EXPECT_EQ(TextOf(first.fRaw), "0");
   EXPECT_EQ(TextOf(first.fWhenFailed), "<the attribute has never failed>");
+  EXPECT_TRUE(*first.fIsPrefailure);
 }
 
 TEST(SmartReportTest, NvmeDisk) {

@@ -20,5 +20,6 @@ for port in /sys/class/net/*; do
   [ -e "$port/device" ] || continue
   ethtool "${port##*/}" > "ethtool-${port##*/}.txt"
   ethtool -i "${port##*/}" > "ethtool-driver-${port##*/}.txt"
+  ethtool -P "${port##*/}" > "ethtool-address-${port##*/}.txt"
 done
 exit 0

@@ -7,12 +7,14 @@
 #
 # MACHINE is the name of the script without ".sh": "server", "degraded". COMMAND is one word, which a shell reads.
 #
-# The virtual machine has two sockets with two cores each, two NUMA nodes, a PCI Express switch with an NVMe disk, a SATA, a SCSI, a virtio,
-# a USB and an SD disk, a CD-ROM drive, ports of two drivers, a TPM, and an IPMI KCS interface.
+# The virtual machine has two sockets with two cores each, two NUMA nodes, eight memory modules, a PCI Express switch with an NVMe
+# disk, a SATA, a SCSI, a virtio, a USB and an SD disk, a CD-ROM drive, ports of two drivers, a TPM, and an IPMI KCS interface. Its
+# firmware describes the boards, processors, caches, modules and slots that server-smbios.py lists.
 #
-# Needs: what run-in-vm.sh needs, and the packages udev, mdadm, lvm2, iproute2, fdisk, e2fsprogs, smartmontools, pci.ids, swtpm.
+# Needs: what run-in-vm.sh needs, and the packages udev, mdadm, lvm2, iproute2, fdisk, e2fsprogs, smartmontools, pci.ids, swtpm,
+# python3.
 set -eu
-[ $# -ge 2 ] || { sed -n '3,14s/^# \{0,1\}//p' "$0" >&2; exit 2; }
+[ $# -ge 2 ] || { sed -n '3,16s/^# \{0,1\}//p' "$0" >&2; exit 2; }
 here=$(cd "$(dirname "$0")" && pwd)
 machine=$1 command=$2
 shift 2
@@ -29,7 +31,9 @@ mkdir "$work/tpm"
 swtpm socket --tpm2 --tpmstate "dir=$work/tpm" --ctrl "type=unixio,path=$work/tpm/socket" --flags startup-clear &
 tpm=$!
 memory="-object memory-backend-ram,size=512M,id=m0 -object memory-backend-ram,size=512M,id=m1"
-cpus="-M q35 -smp 4,sockets=2,cores=2 -m 1024 $memory -numa node,cpus=0-1,memdev=m0 -numa node,cpus=2-3,memdev=m1"
+mkdir "$work/smbios"
+firmware=$(python3 "$here/server-smbios.py" "$work/smbios")
+cpus="-M q35,smbios-entry-point-type=64 -smp 4,sockets=2,cores=2 -m 1024 $memory -numa node,cpus=0-1,memdev=m0 -numa node,cpus=2-3,memdev=m1"
 switch="-device pcie-root-port,id=root,chassis=1,slot=1 -device x3130-upstream,id=up,bus=root"
 switch="$switch -device xio3130-downstream,id=down0,bus=up,chassis=2,slot=2"
 switch="$switch -device xio3130-downstream,id=down1,bus=up,chassis=3,slot=3"
@@ -52,5 +56,5 @@ for program in mdadm lvm ip sfdisk mkfs.ext4 mkfs.vfat smartctl udevadm dmsetup;
   set -- "$@" --file "$(command -v "$program" || echo "/usr/sbin/$program")"
 done
 "$here/run-in-vm.sh" --hw --timeout 240 "$@" --file "$here/machines" \
-  --file /lib/systemd/systemd-udevd --file /lib/udev --file /etc/os-release --file /usr/share/misc/pci.ids --qemu "$cpus $switch $disks $ports $tpm_device" \
+  --file /lib/systemd/systemd-udevd --file /lib/udev --file /etc/os-release --file /usr/share/misc/pci.ids --qemu "$cpus $firmware $switch $disks $ports $tpm_device" \
   sh -c "sh $here/machines/$machine.sh && $command"

@@ -411,7 +411,14 @@ TEST_F(ReportTest, JsonListsEveryInstanceWithItsPath) {
                                                 {"CIM_SystemBIOS", 1},
                                                 {"CIM_ComputerSystemPackage", 2},
                                                 {"CIM_RunningOS", 1},
-                                                {"CIM_ElementStatisticalData", 1}}));
+                                                {"CIM_ElementStatisticalData", 1},
+                                                {"ZEP_ProcessorChip", 2},
+                                                {"ZEP_MemoryModuleSettings", 8},
+                                                {"ZEP_FirmwareSettings", 1},
+                                                {"ZEP_ChassisState", 1},
+                                                {"CIM_Container", 1},
+                                                {"CIM_ElementSettingData", 10},
+                                                {"CIM_Realizes", 2}}));
   std::sort(paths.begin(), paths.end());
   EXPECT_EQ(std::unique(paths.begin(), paths.end()), paths.end());
 }

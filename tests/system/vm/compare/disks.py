@@ -1,0 +1,26 @@
+# SPDX-License-Identifier: Apache-2.0
+"""The facts of smartctl."""
+
+# About the run of smartctl itself.
+OF_THE_RUN = ("json_format_version", "smartctl", "local_time", "drive_database_version", "in_smartctl_database", "device")
+
+
+def leaves(value, path=()):
+    """The values of nested objects and lists, each with the names that lead to it. Numbers of list elements are left out."""
+    if isinstance(value, dict):
+        for name, part in value.items():
+            yield from leaves(part, (*path, name))
+    elif isinstance(value, list):
+        for part in value:
+            yield from leaves(part, path)
+    else:
+        yield ".".join(path), value
+
+
+def facts_of_smartctl(disk, document):
+    table = document.get("ata_smart_attributes", {}).pop("table", [])
+    for fact, value in leaves({name: part for name, part in document.items() if name not in OF_THE_RUN}):
+        yield [disk], fact, value
+    for attribute in table:
+        for fact, value in leaves(attribute):
+            yield [f"ZEP:smart:{disk}:{attribute['id']}"], f"attribute.{fact}", value
