@@ -5,6 +5,7 @@
 
 #include "fuzz/Require.h"
 #include "providers/host/BoardRecords.h"
+#include "providers/host/FirmwareRecords.h"
 #include "providers/host/ProcessorRecords.h"
 #include "providers/host/SmbiosRecords.h"
 #include "providers/host/SmbiosVersion.h"
@@ -35,6 +36,10 @@ void ReadAsEveryRecord(TSmbiosStructure const& structure) {
   RequireWhole(structure, [](auto const& bytes) { return MemoryArrayRecord(bytes, "", 0); });
   RequireWhole(structure, [](auto const& bytes) { return OnboardDeviceRecord(bytes, "", 0); });
   RequireWhole(structure, [&](auto const& bytes) { return IpmiRecord(bytes, "", 0, name); });
+  RequireWhole(structure, [](auto const& bytes) { return FirmwareSettingsRecord(bytes, "", 0); });
+  RequireWhole(structure, [](auto const& bytes) { return ChassisStateRecord(bytes, "", 0); });
+  RequireWhole(structure, [](auto const& bytes) { return ModuleSettingsRecord(bytes, bytes, "", 0); });
+  RequireWhole(structure, [](auto const& bytes) { return ProcessorChipRecord(bytes, "", 0); });
   static_cast<void>(IsSocketFilled(structure));
   static_cast<void>(IsSlotFilled(structure));
   static_cast<void>(HandlesOn(structure));

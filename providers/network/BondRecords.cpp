@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "BondRecords.h"
 
+#include <iterator>
 #include <sstream>
 
 namespace NQRVZEP20 {
@@ -90,6 +91,26 @@ void AddLacp(TRecord& record, TLinkFiles const& files, TText const& mode) {
   record.Add("PartnerMACAddress", WithoutColons(word("bonding/ad_partner_mac")));
 }
 
+// The bits of the state of a port, from the lowest, in the words of ip(8).
+constexpr char const* kLacpStates[] = {"active",     "short_timeout", "aggregating", "in_sync",
+                                       "collecting", "distributing",  "defaulted",   "expired"};
+
+std::vector<std::string> LacpWords(std::uint16_t state) {
+  std::vector<std::string> words;
+  for (std::size_t bit = 0; bit < std::size(kLacpStates); ++bit)
+    if (state >> bit & 1) words.emplace_back(kLacpStates[bit]);
+  return words;
+}
+
+// The number in a file of a member, which reads N/A without LACP.
+template <class T>
+TFinding<T> LacpNumber(TLinkFiles const& files, char const* name) {
+  return files.Line(name).Then([&](std::string const& line) -> TFinding<T> {
+    if (line == "N/A") return TMissing{kMissingNotApplicable, "the bond does not use LACP"};
+    return files.Number<T>(name);
+  });
+}
+
 }  // namespace
 
 bool IsBond(TLink const& link) { return link.IsKind("bond"); }
@@ -143,11 +164,9 @@ TRecord BondMemberRecord(TMachineFiles const& files, TLink const& member, TLinks
   record.Add("LinkFailures", of.Number<std::uint32_t>("bonding_slave/link_failure_count"));
   record.Add("PermanentAddress", WithoutColons(of.Line("bonding_slave/perm_hwaddr")));
   record.Add("QueueID", of.Number<std::uint16_t>("bonding_slave/queue_id"));
-  record.Add("AggregatorID",
-             of.Line("bonding_slave/ad_aggregator_id").Then([&](std::string const& id) -> TFinding<std::uint32_t> {
-               if (id == "N/A") return TMissing{kMissingNotApplicable, "the bond does not use LACP"};
-               return of.Number<std::uint32_t>("bonding_slave/ad_aggregator_id");
-             }));
+  record.Add("AggregatorID", LacpNumber<std::uint32_t>(of, "bonding_slave/ad_aggregator_id"));
+  record.Add("LACPState", LacpNumber<std::uint16_t>(of, "bonding_slave/ad_actor_oper_port_state").Then(LacpWords));
+  record.Add("PartnerLACPState", LacpNumber<std::uint16_t>(of, "bonding_slave/ad_partner_oper_port_state").Then(LacpWords));
   return record;
 }
 

@@ -74,6 +74,7 @@ void FillStorageNamespace(TMemoryNamespace& ns, TMachineFiles const& files) {
   WriteHealth(storage);
   WriteExtents(storage);
   WriteVolumes(storage);
+  WritePools(storage);
   WriteBlockDevices(storage);
   WriteFileSystems(storage);
   storage.fWriter.WriteMissing();

@@ -46,6 +46,7 @@ void WriteControllersAndSlots(TStorage& storage);
 void WriteHealth(TStorage& storage);        // health and wear of disks
 void WriteExtents(TStorage& storage);       // media, partitions, devices without hardware
 void WriteVolumes(TStorage& storage);       // RAID arrays and volumes of the device mapper
+void WritePools(TStorage& storage);         // volume groups
 void WriteBlockDevices(TStorage& storage);  // what the schema has no property for
 void WriteFileSystems(TStorage& storage);   // file systems, mounts, swap areas
 

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "providers/host/RunningRecords.h"
 
+#include "tests/Machines.h"
 #include "tests/Support.h"
 #include "tests/providers/host/KernelTree.h"
 #include "tests/providers/host/Structures.h"
@@ -21,6 +22,13 @@ TEST(RunningRecordsTest, TaintHasAWordForEachBit) {
       TaintWords(1 | 1 << 12 | 1ull << 40),
       ElementsAre("P: a proprietary module was loaded", "O: a module from outside the kernel's tree was loaded", "bit 40"));
   EXPECT_EQ(TaintWords(~0ull).size(), 64u);
+}
+
+TEST(RunningRecordsTest, AFailedUnitOfARealSystemdIsListed) {
+  TRecordedMachine const machine("degraded");
+  TMachineFiles const files(machine.Root());
+  EXPECT_EQ(PropertyOf(RunningRecord(files, TMemInfo::ReadFrom(files, "/proc/meminfo")), "FailedUnits"),
+            "string { backup.service }");
 }
 
 TEST(RunningRecordsTest, FailedUnitsAreThoseOfTheList) {

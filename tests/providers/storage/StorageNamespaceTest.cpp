@@ -34,12 +34,13 @@ protected:
 
 TEST_F(StorageNamespaceTest, AMachineWithoutSysfsHasReasonsForEveryClass) {
   Fill();
-  EXPECT_THAT(ReasonsForNoInstance(),
-              ElementsAre("CIM_DiskDrive", "CIM_CDROMDrive", "CIM_DisketteDrive", "CIM_TapeDrive", "CIM_PhysicalPackage",
-                          "CIM_SoftwareIdentity", "CIM_PCIController", "CIM_Slot", "ZEP_DiskHealth", "ZEP_SmartAttribute",
-                          "CIM_StorageExtent", "CIM_GenericDiskPartition", "CIM_DiskPartition", "CIM_GPTDiskPartition",
-                          "CIM_LogicalDisk", "CIM_StorageVolume", "ZEP_RaidArray", "ZEP_RaidMember", "ZEP_BlockDevice",
-                          "ZEP_BlockQueue", "CIM_UnixLocalFileSystem", "CIM_RemoteFileSystem", "ZEP_Mount", "ZEP_SwapArea"));
+  EXPECT_THAT(
+      ReasonsForNoInstance(),
+      ElementsAre("CIM_DiskDrive", "CIM_CDROMDrive", "CIM_DisketteDrive", "CIM_TapeDrive", "CIM_PhysicalPackage",
+                  "CIM_SoftwareIdentity", "CIM_PCIController", "CIM_Slot", "ZEP_DiskHealth", "ZEP_SmartAttribute",
+                  "CIM_StorageExtent", "CIM_GenericDiskPartition", "CIM_DiskPartition", "CIM_GPTDiskPartition", "CIM_LogicalDisk",
+                  "CIM_StorageVolume", "ZEP_RaidArray", "ZEP_RaidMember", "CIM_StoragePool", "ZEP_BlockDevice", "ZEP_BlockQueue",
+                  "CIM_UnixLocalFileSystem", "CIM_RemoteFileSystem", "ZEP_Mount", "ZEP_SwapArea"));
 }
 
 TEST_F(StorageNamespaceTest, AssociationsLeadFromAPartitionToTheController) {

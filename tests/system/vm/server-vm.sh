@@ -47,14 +47,14 @@ ports="$ports -netdev user,id=n1,restrict=on -device virtio-net-pci,netdev=n1,ma
 tpm_device="-chardev socket,id=tpm,path=$work/tpm/socket -tpmdev emulator,id=tpm0,chardev=tpm -device tpm-tis,tpmdev=tpm0"
 
 kernel=${ZEP_TESTBED_CACHE:-${TMPDIR:-/tmp}/zep-testbeds}/kernel-full
-for module in nvme virtio_pci virtio_blk virtio_net e1000e ahci sdhci-pci mmc_block md-mod raid1 dm-mod bonding 8021q bridge \
+for module in nvme virtio_pci virtio_blk virtio_net e1000e ahci sdhci-pci mmc_block md-mod raid1 dm-mod bonding veth 8021q bridge \
   tpm_tis ipmi_si pcieport acpiphp; do
   modprobe -n -d "$kernel" -S "$(cat "$kernel/release")" "$module" 2>/dev/null || continue
   set -- "$@" --module "$module"
 done
-for program in mdadm lvm ip sfdisk mkfs.ext4 mkfs.vfat smartctl udevadm dmsetup; do
+for program in mdadm lvm ip sfdisk mkfs.ext4 mkfs.vfat smartctl udevadm dmsetup systemctl unshare; do
   set -- "$@" --file "$(command -v "$program" || echo "/usr/sbin/$program")"
 done
-"$here/run-in-vm.sh" --hw --timeout 240 "$@" --file "$here/machines" \
-  --file /lib/systemd/systemd-udevd --file /lib/udev --file /etc/os-release --file /usr/share/misc/pci.ids --qemu "$cpus $firmware $switch $disks $ports $tpm_device" \
+"$here/run-in-vm.sh" --hw --timeout 600 "$@" --file "$here/machines" \
+  --file /lib/systemd/systemd --file /lib/systemd/systemd-udevd --file /lib/udev --file /etc/os-release --file /usr/share/misc/pci.ids --qemu "$cpus $firmware $switch $disks $ports $tpm_device" \
   sh -c "sh $here/machines/$machine.sh && $command"

@@ -1,8 +1,8 @@
 #!/bin/sh
 # SPDX-License-Identifier: Apache-2.0
 #
-# A server with a varied network: the bond, VLAN and bridge of the other servers, further names, a VLAN of another protocol, and
-# addresses and routes of every kind.
+# A server with a varied network: the bond, VLAN and bridge of the other servers, bonds with LACP, further names, a VLAN of another
+# protocol, and addresses and routes of every kind.
 set -eu
 hostname network
 . "${0%/*}/ports.sh"
@@ -18,4 +18,11 @@ ip route add 198.18.0.0/15 via 192.0.2.3 proto bgp metric 70000
 ip route add unreachable 192.0.2.128/25
 ip -6 route add default via 2001:db8::1 metric 2000
 printf 'options ndots:2 timeout:1\n' >> /etc/resolv.conf
-sleep 1
+# Two bonds with LACP are each other's partners.
+ip link add port-a type veth peer name port-b
+for end in a b; do
+  ip link add "lacp-$end" type bond mode 802.3ad miimon 100 lacp_rate fast xmit_hash_policy layer3+4
+  ip link set "port-$end" master "lacp-$end"
+  ip link set "lacp-$end" up
+done
+sleep 6
