@@ -1,0 +1,169 @@
+// SPDX-License-Identifier: Apache-2.0
+
+// zep report with all providers of this project, on recorded machines that lack something or contain hostile texts.
+
+#include "tests/Machines.h"
+#include "tests/tools/zep/Zep.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <set>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+using testing::AnyOf;
+using testing::HasSubstr;
+using testing::IsEmpty;
+using testing::Not;
+
+constexpr int kIncomplete = 2;  // the exit status when the serial number or the like is unknown
+
+// Sequences that control a terminal, markup, quotes, bytes that are not UTF-8, and a character that reverses the writing
+// direction.
+constexpr char kHostile[] = "X\x1b]0;title\x07\x1b[31m\x9b\x33\x31m<b a='1'>&amp;\"$(id)`id`%s%n\\\xff\xfe\xc3\x28\xe2\x80\xae";
+
+// The files of sysfs whose content is text of a device.
+std::set<std::string> const kTextFiles = {"model",        "vendor",      "serial",    "product", "manufacturer", "rev",
+                                          "firmware_rev", "firmware_id", "ifalias",   "label",   "name",         "description",
+                                          "unique_id",    "wwid",        "subsysnqn", "mode",    "state",        "interface"};
+
+class UnusualMachinesTest : public testing::Test {
+protected:
+  UnusualMachinesTest() {
+    for (char const* library : {"libDevices.nsp.so", "libNetwork.nsp.so", "libStorage.nsp.so"})
+      fInstalled.Add(library, std::string(TEST_LIB_DIR "/") + library);
+  }
+
+  TRun Report(std::vector<std::string> const& options) {
+    TCall call{{"report", "--plugin-timeout", "60"}, {{"ZEP_ROOT", fMachine.Root()}}};
+    call.fArguments.insert(call.fArguments.end(), options.begin(), options.end());
+    return fInstalled.Run(call);
+  }
+
+  void Remove(std::string const& path) { fs::remove_all(fMachine.Root() + path); }
+
+  // Replaces the texts that devices, udev and the distribution have written.
+  int MakeHostile() {
+    int replaced = 0;
+    for (auto const& entry : fs::recursive_directory_iterator(fMachine.Root())) {
+      if (!entry.is_regular_file() || entry.is_symlink()) continue;
+      std::string const path = entry.path().string();
+      if (kTextFiles.count(entry.path().filename().string()) > 0)
+        WriteFile(path, std::string(kHostile) + "\n");
+      else if (path.find("/run/udev/data/") != std::string::npos || path.find("/etc/os-release") != std::string::npos)
+        WriteFile(path,
+                  std::regex_replace(ReadFile(path), std::regex("(E:ID_MODEL[A-Z_]*|E:ID_FS_LABEL|E:DM_NAME|PRETTY_NAME)=.*"),
+                                     "$1=" + std::regex_replace(kHostile, std::regex("\\$"), "$$$$")));
+      else
+        continue;
+      ++replaced;
+    }
+    return replaced;
+  }
+
+  TInstallation fInstalled;
+  TRecordedMachine fMachine{"server"};
+};
+
+// No control character but line feeds, and valid UTF-8 without the second set of control characters.
+void ExpectHarmless(std::string const& text) {
+  EXPECT_TRUE(std::all_of(text.begin(), text.end(), [](unsigned char c) { return c == '\n' || (c >= 0x20 && c != 0x7f); }));
+  EXPECT_NO_THROW(nlohmann::json(text).dump()) << "not UTF-8";
+  EXPECT_FALSE(std::regex_search(text, std::regex("\xc2[\x80-\x9f]|\xe2\x80[\xaa-\xae]")));
+}
+
+std::set<std::string> ClassesIn(nlohmann::json const& document) {
+  std::set<std::string> classes;
+  for (auto const& instance : document["instances"]) classes.insert(instance["class"].get<std::string>());
+  return classes;
+}
+
+// The values that are missing without a reason, as "class.property".
+std::vector<std::string> WithoutReason(nlohmann::json const& document) {
+  std::vector<std::string> names;
+  for (auto const& instance : document["instances"])
+    for (auto const& [name, property] : instance["properties"].items())
+      if (property["value"].is_null() && property.value("reason", "").empty())
+        names.push_back(instance["class"].get<std::string>() + "." + name);
+  return names;
+}
+
+void ExpectEveryPlugInWorks(nlohmann::json const& document) {
+  EXPECT_EQ(document["plugIns"].size(), 4u);
+  for (auto const& plugIn : document["plugIns"]) EXPECT_TRUE(plugIn["error"].is_null()) << plugIn;
+}
+
+TEST_F(UnusualMachinesTest, HostileTextsOfDevicesDoNoHarm) {
+  EXPECT_GT(MakeHostile(), 50);
+  for (std::vector<std::string> const& options : {std::vector<std::string>{}, {"--full"}}) {
+    TRun const run = Report(options);
+    EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+    EXPECT_THAT(run.fOutput, HasSubstr("X\\x1b]0;title\\x07\\x1b[31m")) << "the text itself is shown";
+    ExpectHarmless(run.fOutput);
+    ExpectHarmless(run.fErrors);
+  }
+  TRun const run = Report({"--json"});
+  EXPECT_EQ(run.fStatus, 0);
+  ExpectEveryPlugInWorks(JsonOf(run));
+  EXPECT_THAT(WithoutReason(JsonOf(run)), IsEmpty());
+}
+
+TEST_F(UnusualMachinesTest, AContainerWithoutSysfsHasReasons) {
+  Remove("/sys");
+  Remove("/run");
+  TRun const run = Report({"--json"});
+  EXPECT_EQ(run.fStatus, kIncomplete) << run.fErrors;
+  auto const document = JsonOf(run);
+  ExpectEveryPlugInWorks(document);
+  EXPECT_THAT(WithoutReason(document), IsEmpty());
+  auto const classes = ClassesIn(document);
+  EXPECT_EQ(classes.count("QRVSG_OperatingSystem"), 1u);
+  for (char const* absent : {"CIM_DiskDrive", "CIM_PCIDevice", "CIM_Chassis"}) EXPECT_EQ(classes.count(absent), 0u) << absent;
+  EXPECT_EQ(Report({}).fStatus, kIncomplete);
+}
+
+TEST_F(UnusualMachinesTest, AMachineWithoutSmbiosIsDescribedByTheKernel) {
+  Remove("/sys/firmware/dmi");
+  Remove("/sys/class/dmi");
+  auto const document = JsonOf(Report({"--json"}));
+  ExpectEveryPlugInWorks(document);
+  EXPECT_THAT(WithoutReason(document), IsEmpty());
+  auto const classes = ClassesIn(document);
+  for (char const* present : {"CIM_Processor", "CIM_ProcessorCore", "CIM_Memory", "CIM_DiskDrive", "CIM_EthernetPort"})
+    EXPECT_EQ(classes.count(present), 1u) << present;
+  for (char const* absent : {"CIM_Chassis", "CIM_PhysicalMemory", "CIM_BIOSElement"})
+    EXPECT_EQ(classes.count(absent), 0u) << absent;
+}
+
+TEST_F(UnusualMachinesTest, DevicesThatVanishAfterTheListingAreOmitted) {
+  auto const before = JsonOf(Report({"--json"}));
+  // The links that list the devices stay.
+  for (std::string const link : {"/sys/class/block/sda", "/sys/bus/pci/devices/0000:04:00.0"}) {
+    ASSERT_TRUE(fs::exists(fMachine.Root() + link)) << link;
+    fs::remove_all(fs::canonical(fMachine.Root() + link));
+  }
+  TRun const run = Report({"--json"});
+  EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+  auto const after = JsonOf(run);
+  ExpectEveryPlugInWorks(after);
+  EXPECT_THAT(WithoutReason(after), IsEmpty());
+  EXPECT_THAT(before.dump(), HasSubstr("DeviceID=\\\"sda\\\""));
+  EXPECT_THAT(after.dump(), Not(HasSubstr("CIM_DiskDrive.CreationClassName=\\\"CIM_DiskDrive\\\",DeviceID=\\\"sda\\\"")));
+  EXPECT_THAT(after.dump(), HasSubstr("DeviceID=\\\"nvme0n1\\\""));
+}
+
+// The machine on which the test runs, whatever it is.
+TEST_F(UnusualMachinesTest, WithoutRootEveryGapHasAReason) {
+  TRun const run = fInstalled.Run({{"report", "--json", "--plugin-timeout", "60"}, {}, true});
+  EXPECT_THAT(run.fStatus, AnyOf(0, kIncomplete)) << run.fErrors;
+  auto const document = JsonOf(run);
+  ExpectEveryPlugInWorks(document);
+  EXPECT_THAT(WithoutReason(document), IsEmpty());
+  EXPECT_EQ(ClassesIn(document).count("QRVSG_OperatingSystem"), 1u);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep
