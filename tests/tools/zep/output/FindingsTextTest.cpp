@@ -57,7 +57,8 @@ TInstallation* FindingsTextTest::fInstalled = nullptr;
 
 TEST_F(FindingsTextTest, TheFaultsOfADegradedMachineAreFound) {
   nlohmann::json const document = JsonOf(Report("degraded", {"--json"}));
-  EXPECT_THAT(ProblemsOf(document), ElementsAre("critical array-degraded", "error file-system-full", "error bond-member"));
+  EXPECT_THAT(ProblemsOf(document),
+              ElementsAre("critical array-degraded", "error file-system-full", "error bond-member", "warning failed-units"));
   nlohmann::json const& array = document["findings"]["problems"][0];
   EXPECT_EQ(array["reason"], "the RAID array md0 is degraded: 1 of 2 members is missing");
   EXPECT_EQ(array["remedy"], "Replace the failed disk and add the new one (mdadm --add).");
@@ -65,12 +66,16 @@ TEST_F(FindingsTextTest, TheFaultsOfADegradedMachineAreFound) {
   EXPECT_EQ(document["findings"]["worst"], "critical");
 }
 
-TEST_F(FindingsTextTest, HealthyMachinesHaveNone) {
-  for (char const* machine : {"server", "network"}) {
-    nlohmann::json const document = JsonOf(Report(machine, {"--json"}));
-    EXPECT_THAT(ProblemsOf(document), IsEmpty()) << machine;
-    EXPECT_TRUE(document["findings"]["worst"].is_null());
-  }
+TEST_F(FindingsTextTest, AHealthyMachineHasNone) {
+  nlohmann::json const document = JsonOf(Report("server", {"--json"}));
+  EXPECT_THAT(ProblemsOf(document), IsEmpty());
+  EXPECT_TRUE(document["findings"]["worst"].is_null());
+}
+
+TEST_F(FindingsTextTest, BondsWithOneMemberAreFound) {
+  nlohmann::json const document = JsonOf(Report("network", {"--json"}));
+  EXPECT_THAT(ProblemsOf(document), ElementsAre("warning bond-member", "warning bond-member"));
+  EXPECT_EQ(document["findings"]["problems"][0]["reason"], "the bond lacp-a has only one member");
 }
 
 TEST_F(FindingsTextTest, EveryRuleHasAnAnswerAndEveryUnansweredOneAReason) {
@@ -88,7 +93,7 @@ TEST_F(FindingsTextTest, EveryRuleHasAnAnswerAndEveryUnansweredOneAReason) {
 
 TEST_F(FindingsTextTest, TheTextBeginsWithTheProblemsAndTheirRemedies) {
   std::string const text = Report("degraded").fOutput;
-  EXPECT_THAT(text, HasSubstr("\n\nFindings: 1 critical, 2 errors ("));
+  EXPECT_THAT(text, HasSubstr("\n\nFindings: 1 critical, 2 errors, 1 warning ("));
   EXPECT_THAT(text, HasSubstr("\ncritical     the RAID array md0 is degraded: 1 of 2 members is missing.\n"
                               "             Replace the failed disk and add the new one (mdadm --add).\n"
                               "error        the file system on /data is full.\n"
@@ -112,7 +117,7 @@ TEST_F(FindingsTextTest, FailOnGivesStatus3ForThatSeverityOrAWorseOne) {
   nlohmann::json const document = JsonOf(run);
   EXPECT_EQ(run.fStatus, 3);
   EXPECT_EQ(document["exitStatus"], 3);
-  EXPECT_EQ(document["reason"], "1 critical, 2 errors");
+  EXPECT_EQ(document["reason"], "1 critical, 2 errors, 1 warning");
 }
 
 TEST_F(FindingsTextTest, AnUnknownSeverityIsWrongUsage) {
