@@ -49,7 +49,7 @@ std::string SectionAsText(TReportSection const& section, std::string const& labe
 
   std::size_t const count = limit == 0 ? section.fRows.size() : std::min(limit, section.fRows.size());
   TRows const rows = TextRows(section, count);
-  TTable table(WidthsFor(rows));
+  TTable table(WidthsFor(rows), ENarrowTable::kBreaksWords);
   for (auto const& row : rows) table.Add(row);
   std::string const text = title + "\n" + table.GetText();
   if (count == section.fRows.size()) return text;

@@ -152,7 +152,7 @@ std::vector<std::size_t> TTable::WidthsFor(ELayout layout, std::size_t lineWidth
   TWidths widths = fWidths;
   for (std::size_t at = 0; at < widths.size(); ++at) widths[at] = std::max(widths[at], needed[at]);
   Narrow(widths, needed, lineWidth);
-  Narrow(widths, least, lineWidth);
+  if (fNarrow == ENarrowTable::kBreaksWords) Narrow(widths, least, lineWidth);
   if (layout == ELayout::kTerminal) Widen(widths, whole, lineWidth);
   return widths;
 }

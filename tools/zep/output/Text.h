@@ -27,13 +27,20 @@ std::string SizeText(std::uint64_t bytes);
 // An exact size, in the largest unit that divides it: "512 MiB", "1025 bytes".
 std::string ExactSizeText(std::uint64_t bytes);
 
+// How a table treats a line that is too short for its longest words.
+enum class ENarrowTable {
+  kLongLines,   // words stay whole, so that they can be copied; lines are then too long
+  kBreaksWords  // lines keep the width; words of the widest columns are broken
+};
+
 // A table with a title line and columns separated by two blanks. A cell that is too long for its column is wrapped. A number with
-// its unit stays on one line; a word is broken only if it is longer than three quarters of a line, or if the words of all columns
-// do not fit on a line together: then those of the widest column. Cells are made printable (SafeText.h) by this class.
+// its unit stays on one line; a word that is longer than three quarters of a line is always broken. Cells are made printable
+// (SafeText.h) by this class.
 class TTable {
 public:
   // `widths`: the widths of the columns on a line of 80, in characters.
-  explicit TTable(std::vector<std::size_t> widths) : fWidths(std::move(widths)) {}
+  explicit TTable(std::vector<std::size_t> widths, ENarrowTable narrow = ENarrowTable::kLongLines)
+      : fWidths(std::move(widths)), fNarrow(narrow) {}
 
   void Add(std::vector<std::string> const& cells);  // one cell per column
   bool IsEmpty() const { return fRows.empty(); }
@@ -49,6 +56,7 @@ private:
   std::vector<std::size_t> WidthsFor(ELayout layout, std::size_t lineWidth) const;
 
   std::vector<std::size_t> fWidths;
+  ENarrowTable fNarrow;
   std::vector<std::vector<std::string>> fRows;
 };
 

@@ -73,7 +73,7 @@ TEST(TextTest, AWordThatFillsMostOfTheLineIsBroken) {
 }
 
 TEST(TextTest, AQuantityStaysOnOneLine) {
-  TTable table({10, 4, 4});
+  TTable table({10, 4, 4}, ENarrowTable::kBreaksWords);
   table.Add({"Name", "Size", "Free"});
   table.Add({"/mnt/a/name", "11.8 GiB", "4 KiB"});
   EXPECT_EQ(table.TextFor(ELayout::kFile, 80), "Name         Size      Free\n/mnt/a/name  11.8 GiB  4 KiB\n");
@@ -90,7 +90,7 @@ TEST(TextTest, HostileNamesBreakNeitherQuantitiesNorLines) {
       "1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16 17 18 19 20 21 22 23 24 25 26 27 28 29 30 31 32 33 34 35 36 37 38 39 40",
       "1 " + std::string(200, 'x'),
       "<script>" + std::string(60, '\xff')};
-  TTable table({40, 8, 8, 7, 9});
+  TTable table({40, 8, 8, 7, 9}, ENarrowTable::kBreaksWords);
   table.Add({"File system", "Type", "Size", "Free", "Read-only"});
   for (std::string const& name : names) table.Add({name, "squashfs", "1023.9 GiB", "11.8 GiB", "false"});
 
