@@ -17,8 +17,8 @@ struct TReportParts {
 // The names of all sections: the findings, the identity, the details, those of collect/Sections.h and the plug-ins.
 std::vector<std::string> SectionNames();
 
-// The report as text: the head lines and the findings, then a table for each section. Of a section with many rows, only the first are printed,
-// unless the parts name it.
+// The report as text: the head lines and the findings, then a table for each section. Of a section with many rows, only the first
+// are printed, unless the parts name it.
 std::string ReportAsText(TReport const& report, TReportParts const& parts = {});
 
 }  // namespace NQRVZEP20::zep
