@@ -273,7 +273,7 @@ private:
   std::size_t fCount = 0;
 };
 
-// zep is back soon after the limit: nobody waits for a supervisor that is stopped.
+// zep ends soon after the limit: it does not wait for a supervisor that is stopped.
 TEST_F(ProvidersTest, APlugInThatStopsItsSupervisorIsNamedSoonAfterItsLimit) {
   NEEDS(::geteuid() == 0, "root, who may trace every process");
   fZep.Remove("libHost.nsp.so");
