@@ -17,8 +17,8 @@ constexpr char const* kLabels[] = {"Error", "Warning", "Status", "Debug", "Verbo
 
 constexpr std::size_t kEnd = 64 * 1024;  // searched for the last entry
 
-// The entry that the line begins; none if it continues one. Most logs have no entry, so that nobody waits for the expression,
-// which takes longer to compile than many lines to read.
+// The entry that the line begins; none if it continues one. The expression is compiled at the first entry: that takes longer than
+// reading many lines, and most logs have no entry.
 std::optional<TLogLine> EntryIn(std::string const& line) {
   if (line.rfind("FDR_[", 0) != 0) return std::nullopt;
   static std::regex const entry(R"(FDR_\[(Error|Warning|Status|Debug|Verbose)\] \d+/\d+/\d+  \d+:\d+:\d+ )");
