@@ -31,7 +31,7 @@ TFinding<std::uint64_t> BootSeconds(TMachineFiles const& files) {
 }
 
 TFinding<TCIMDateTime> DateTimeFrom(std::uint64_t secondsSince1970) {
-  std::time_t const seconds = static_cast<std::time_t>(secondsSince1970);
+  auto const seconds = static_cast<std::time_t>(secondsSince1970);
   std::tm utc = {};
   if (secondsSince1970 > 253402300799 || ::gmtime_r(&seconds, &utc) == nullptr)  // the end of the year 9999
     return TMissing{kMissingUnexpected, std::to_string(secondsSince1970) + " seconds after 1970 is not a date"};
