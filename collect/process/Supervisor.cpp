@@ -13,10 +13,13 @@
 
 #include <cerrno>
 #include <cstdlib>
+#include <utility>
 
 namespace NQRVZEP20 {
 
 namespace {
+
+constexpr int kMillisecondsToEnd = 20;
 
 void ResetSignals() {
   for (int signal = 1; signal < NSIG; ++signal) ::signal(signal, SIG_DFL);
@@ -45,7 +48,13 @@ TUniqueFd BlockAndWatchChildren() {
 
 class TSupervised {
 public:
-  TSupervised(pid_t child, int failure) : fChild(child), fVerdict{0, false, failure} {}
+  TSupervised(pid_t child, TUniqueFd signals)
+      : fChild(child), fSignals(std::move(signals)), fVerdict{0, false, fSignals ? 0 : errno} {}
+
+  // Until the child has ended or the owner has closed the control pipe.
+  void WaitForEnd(int control) {
+    while (!HasEnded() && Wait(control, -1) == 0) continue;
+  }
 
   // Reaps the child, and orphans that became children. True when the child has ended.
   bool HasEnded() {
@@ -54,9 +63,14 @@ public:
     return fHasEnded;
   }
 
-  // Ends every child. The children of an ended one become children of this process, and are ended in their turn.
+  // Ends every child. The children of an ended one become children of this process, and are ended in their turn. The plug-in
+  // comes first: most have no other process, and the list of the children takes longer than its end.
   void EndAll() {
     fVerdict.fHadEndedByItself = HasEnded();
+    if (!fHasEnded) {
+      ::kill(fChild, SIGKILL);
+      Wait(-1, kMillisecondsToEnd);
+    }
     int status = 0;
     while (true) {
       pid_t ended = ::waitpid(-1, &status, WNOHANG);
@@ -72,6 +86,16 @@ public:
   TVerdict const& Verdict() const { return fVerdict; }
 
 private:
+  // Waits for a signal, the closing of the control pipe (-1: not for that), or these milliseconds (-1: for ever). Returns what
+  // poll(2) reports of the control pipe.
+  short Wait(int control, int milliseconds) const {
+    pollfd polled[] = {{control, POLLIN, 0}, {fSignals.get(), POLLIN, 0}};
+    ::poll(polled, 2, milliseconds);
+    signalfd_siginfo ignored;
+    while (::read(fSignals.get(), &ignored, sizeof ignored) > 0) continue;
+    return polled[0].revents;
+  }
+
   // A traced child that stops has a status, too.
   void Note(pid_t ended, int status) {
     if (ended != fChild || WIFSTOPPED(status)) return;
@@ -86,19 +110,10 @@ private:
   }
 
   pid_t const fChild;
+  TUniqueFd const fSignals;  // of BlockAndWatchChildren
   bool fHasEnded = false;
   TVerdict fVerdict;
 };
-
-// Until the child has ended or the owner has closed the control pipe.
-void WaitForEnd(TSupervised& supervised, int signals, int control) {
-  pollfd polled[] = {{control, POLLIN, 0}, {signals, POLLIN, 0}};
-  while (!supervised.HasEnded() && polled[0].revents == 0) {
-    ::poll(polled, 2, -1);
-    signalfd_siginfo ignored;
-    while (::read(signals, &ignored, sizeof ignored) > 0) continue;
-  }
-}
 
 void Send(int fd, TVerdict const& verdict) { [[maybe_unused]] ssize_t const sent = ::write(fd, &verdict, sizeof verdict); }
 
@@ -120,9 +135,8 @@ void Supervise(TSupervisorEnds const& ends, std::function<void()> const& work) n
   ResetSignals();
   CloseAllBut({ends.fControl, ends.fVerdict});
   for (int const fd : {0, 1, 2}) MakeNull(fd);
-  TUniqueFd const ended = BlockAndWatchChildren();
-  TSupervised supervised(child, ended ? 0 : errno);
-  if (ended) WaitForEnd(supervised, ended.get(), ends.fControl);
+  TSupervised supervised(child, BlockAndWatchChildren());
+  if (supervised.Verdict().fStartFailure == 0) supervised.WaitForEnd(ends.fControl);
   supervised.EndAll();
   Send(ends.fVerdict, supervised.Verdict());
   ::_exit(0);
