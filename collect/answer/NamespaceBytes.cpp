@@ -509,6 +509,8 @@ void WriteNamespace(ICIMNamespace const& ns, std::function<void(std::string_view
   TByteWriter writer;
   TSchema const schema(ns);
   TSchemaWriter(ns, schema, writer).Write();
+  send(writer.Bytes());
+  writer.Clear();
   TInstanceWriter(schema, writer, send, noteInstance).Write();
 }
 

@@ -49,10 +49,10 @@ enum EPath : unsigned int {
   kPathApart    // any other path, as a reference
 };
 
-// Serialises the namespace and passes the bytes to `send` in chunks, in order. Calls the provider for every element, so it
-// blocks as long as the provider does. These exceptions pass through: those of the provider for which the format has no place,
-// std::bad_alloc, and those of `send`. `noteInstance`, which may be empty, is called after each instance with the name of its
-// class.
+// Serialises the namespace and passes the bytes to `send` in chunks, in order; the first chunk ends with the classes. Calls the
+// provider for every element, so it blocks as long as the provider does. These exceptions pass through: those of the provider for
+// which the format has no place, std::bad_alloc, and those of `send`. `noteInstance`, which may be empty, is called after each
+// instance with the name of its class.
 void WriteNamespace(ICIMNamespace const& ns, std::function<void(std::string_view bytes)> const& send,
                     std::function<void(std::string const& className)> const& noteInstance = {});
 

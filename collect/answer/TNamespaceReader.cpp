@@ -18,10 +18,21 @@ constexpr std::uint64_t kAnyNumber = std::numeric_limits<unsigned int>::max();
 
 }  // namespace
 
-TNamespaceReader::TNamespaceReader(boost::shared_ptr<TReceivedNamespace> ns, TAnswerCounts& counts)
-    : fNamespace(ns), fNs(*ns), fCounts(counts), fReader(ns->ReaderAt(0)), fChecker(0, counts.fValues) {}
+TNamespaceReader::TNamespaceReader(TAnswerCounts& counts)
+    : fNamespace(new TReceivedNamespace),
+      fNs(*fNamespace),
+      fCounts(counts),
+      fReader(fNs.ReaderAt(0)),
+      fChecker(0, counts.fValues) {}
 
-void TNamespaceReader::Read() {
+void TNamespaceReader::Add(std::string_view bytes) {
+  std::size_t const at = fReader.At();
+  fNs.fBytes += bytes;
+  fReader = fNs.ReaderAt(at);  // the bytes may have moved
+}
+
+void TNamespaceReader::ReadClasses() {
+  if (std::exchange(fHasClasses, true)) return;
   if (fReader.Text() != kNamespaceForm || fReader.Number() != kNamespaceVersion)
     throw TBadAnswer("it is not a namespace of version " + std::to_string(kNamespaceVersion));
   fNs.fName = ReadName();
@@ -31,9 +42,14 @@ void TNamespaceReader::Read() {
   ReadQualifierDecls();
   while (fNs.fClasses.size() < fClassCount) ReadClass();
   fNs.fClassesFailure = ReadEnding();
+}
+
+boost::shared_ptr<TReceivedNamespace> TNamespaceReader::Finish() {
+  ReadClasses();
   for (std::size_t number = 0; number < fClassCount; ++number)
     if (fNs.fRoots[number] == number) ReadTree(number);
   if (fReader.Left() != 0) throw TBadAnswer("there are bytes after the end");
+  return fNamespace;
 }
 
 void TNamespaceReader::ReadQualifierDecls() {

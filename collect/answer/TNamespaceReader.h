@@ -6,13 +6,19 @@
 
 namespace NQRVZEP20 {
 
-// Validates the bytes of a received namespace and creates its elements.
+// Validates the bytes of a received namespace and creates its elements. The classes can be read while the bytes of the instances
+// are still to come. After an exception the reader can only be destroyed.
 class TNamespaceReader {
 public:
-  // `counts`, which outlives the reader, is that of the plug-in.
-  TNamespaceReader(boost::shared_ptr<TReceivedNamespace> ns, TAnswerCounts& counts);
+  explicit TNamespaceReader(TAnswerCounts& counts);  // of the plug-in; outlives the reader
 
-  void Read();  // throws TBadAnswer
+  void Add(std::string_view bytes);
+
+  // Reads all up to the ending of the classes, which must have been added. Does nothing the second time. Throws TBadAnswer.
+  void ReadClasses();
+
+  // Reads the rest, which must be complete, and returns the namespace. Call it once. Throws TBadAnswer.
+  boost::shared_ptr<TReceivedNamespace> Finish();
 
 private:
   using TQualifiers = std::vector<boost::shared_ptr<TReceivedQualifier>>;
@@ -41,6 +47,7 @@ private:
   TReceivedNamespace& fNs;
   TAnswerCounts& fCounts;
   TByteReader fReader;
+  bool fHasClasses = false;
   std::size_t fClassCount = 0;
   TValueChecker fChecker;
   std::vector<std::size_t> fDepths;  // of the classes

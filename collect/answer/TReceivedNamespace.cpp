@@ -13,15 +13,15 @@ namespace NQRVZEP20 {
 
 void RefuseChange() { throw TZEPException(kZEPStatusNotSupported); }
 
-boost::shared_ptr<TReceivedNamespace> TReceivedNamespace::From(std::string bytes, TAnswerCounts& counts) {
-  boost::shared_ptr<TReceivedNamespace> const ns(new TReceivedNamespace(std::move(bytes)));
-  TNamespaceReader(ns, counts).Read();
-  return ns;
+boost::shared_ptr<TReceivedNamespace> TReceivedNamespace::From(std::string_view bytes, TAnswerCounts& counts) {
+  TNamespaceReader reader(counts);
+  reader.Add(bytes);
+  return reader.Finish();
 }
 
-boost::shared_ptr<TReceivedNamespace> TReceivedNamespace::From(std::string bytes) {
+boost::shared_ptr<TReceivedNamespace> TReceivedNamespace::From(std::string_view bytes) {
   TAnswerCounts counts;
-  return From(std::move(bytes), counts);
+  return From(bytes, counts);
 }
 
 std::string TReceivedNamespace::GetName(TCIMContext const&) const { return fName; }

@@ -33,8 +33,8 @@ class TReceivedNamespace : public ICIMNamespace,
 public:
   // Throws TBadAnswer for bytes that are not a namespace, or exceed the limits (AnswerLimits.h) together with those that `counts`
   // counts already.
-  static boost::shared_ptr<TReceivedNamespace> From(std::string bytes, TAnswerCounts& counts);
-  static boost::shared_ptr<TReceivedNamespace> From(std::string bytes);  // of a plug-in without other namespaces
+  static boost::shared_ptr<TReceivedNamespace> From(std::string_view bytes, TAnswerCounts& counts);
+  static boost::shared_ptr<TReceivedNamespace> From(std::string_view bytes);  // of a plug-in without other namespaces
 
   std::string GetName(TCIMContext const& context) const override;
   boost::shared_ptr<ICIMClass> CreateClass(boost::shared_ptr<ICIMClass> superClass, std::string const& name,
@@ -75,12 +75,12 @@ private:
 
   using TByKeys = std::unordered_map<std::string, boost::shared_ptr<TReceivedInstance>>;  // by KeyText of their paths
 
-  explicit TReceivedNamespace(std::string bytes) : fBytes(std::move(bytes)) {}
+  TReceivedNamespace() = default;
   TByKeys const& InstancesByKeys(std::size_t cls) const;               // of exactly that class
   std::vector<std::size_t> TreeOf(std::size_t cls) const;              // the class and those below it, in their order
   std::vector<std::size_t> const& InstancesOf(std::size_t cls) const;  // of exactly that class, in the tree of its root
 
-  std::string const fBytes;
+  std::string fBytes;
   std::string fName;
   std::vector<boost::shared_ptr<TReceivedQualifierDecl>> fQualifierDecls;
   std::vector<boost::shared_ptr<TReceivedClass>> fClasses;

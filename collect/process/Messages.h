@@ -16,6 +16,7 @@ enum class EMessage : unsigned char {
   kLoaded,       // loading has ended: the time in microseconds, as text
   kFilling,      // a provider begins to fill its namespace: its name
   kBytes,        // a chunk of the serialised namespace (NamespaceBytes.h)
+  kClasses,      // the chunks so far are all up to the ending of the classes
   kFilled,       // the namespace is complete: the time to fill it in microseconds, as text
   kFailed,       // loading, or the provider, has failed: why. Later messages are about the next provider
   kFatal,        // the same, but the process ends

@@ -18,6 +18,7 @@
 #include <stdlib.h>
 #include <sys/prctl.h>
 #include <sys/resource.h>
+#include <sys/uio.h>
 #include <unistd.h>
 #include <boost/make_shared.hpp>
 
@@ -32,6 +33,7 @@
 #include <mutex>
 #include <optional>
 #include <stdexcept>
+#include <utility>
 
 namespace NQRVZEP20 {
 
@@ -56,6 +58,16 @@ void WriteWhole(std::string_view bytes) {
   }
 }
 
+// At once, because each write wakes the owner; without a copy, because memory may be exhausted.
+void WriteBoth(std::string_view head, std::string_view text) {
+  iovec const both[] = {{const_cast<char*>(head.data()), head.size()}, {const_cast<char*>(text.data()), text.size()}};
+  ssize_t const count = ::writev(gAnswer, both, 2);
+  std::size_t const written = count < 0 ? 0 : static_cast<std::size_t>(count);
+  std::size_t const ofHead = std::min(written, head.size());
+  WriteWhole(head.substr(ofHead));
+  WriteWhole(text.substr(written - ofHead));
+}
+
 void Send(EMessage kind, std::string_view text) {
   if (IsCopy()) ::_exit(0);  // it returned from the plug-in's code
   std::lock_guard const lock(gSending);
@@ -64,8 +76,7 @@ void Send(EMessage kind, std::string_view text) {
     text.remove_prefix(kLongestMessage);
   }
   std::string_view const sent = text.substr(0, kLongestMessage);
-  WriteWhole(HeadOf(kind, sent.size()));
-  WriteWhole(sent);
+  WriteBoth(HeadOf(kind, sent.size()), sent);
 }
 
 void SendTime(EMessage kind, double milliseconds) { Send(kind, std::to_string(std::llround(milliseconds * 1000))); }
@@ -201,7 +212,11 @@ void Load(TChildSetup const& setup) {
 }
 
 void Serialise(ICIMNamespace const& ns, bool isMeasured) {
-  auto const send = [](std::string_view bytes) { Send(EMessage::kBytes, bytes); };
+  bool isFirst = true;
+  auto const send = [&isFirst](std::string_view bytes) {
+    Send(EMessage::kBytes, bytes);
+    if (std::exchange(isFirst, false)) Send(EMessage::kClasses, "");
+  };
   if (!isMeasured) return WriteNamespace(ns, send);
   TClassMeter meter;
   WriteNamespace(ns, send, [&](std::string const& className) { meter.Note(className); });

@@ -44,11 +44,13 @@ void TPlugInAnswer::Take(TMessage const& message) {
       return TakeLoaded(text);
     case EMessage::kBytes:
       fAnswerBytes += text.size();
-      if (fAnswerBytes <= fLimits.fAnswerBytes)
-        fBytes += text;
-      else
+      if (fAnswerBytes > fLimits.fAnswerBytes)
         fState = EState::kTooLong;
+      else if (fNamespace)
+        fNamespace->Add(text);
       return;
+    case EMessage::kClasses:
+      return TakeClasses();
     case EMessage::kFilled:
       return TakeNamespace(text);
     case EMessage::kFailed:
@@ -82,7 +84,7 @@ void TPlugInAnswer::TakeName(TMessage const& message) {
     return Refuse("the name of a provider has more than " + std::to_string(kLongestName) + " bytes");
   if (message.fKind == EMessage::kFilling) {
     fProvider = name;
-    fBytes.clear();
+    fNamespace.emplace(fCounts);
     return Begin(EStage::kFill);
   }
   if (message.fKind == EMessage::kRegistered)
@@ -98,18 +100,22 @@ void TPlugInAnswer::TakeLoaded(std::string const& microseconds) {
   fHasLoaded = true;
 }
 
+// While the plug-in serialises its instances.
+void TPlugInAnswer::TakeClasses() {
+  if (!fNamespace) return;
+  std::string const failure = FailureOf([&] { fNamespace->ReadClasses(); });
+  if (!failure.empty()) Fail(failure);
+}
+
 void TPlugInAnswer::TakeNamespace(std::string const& microseconds) {
   auto const milliseconds = MillisecondsIn(microseconds);
   TProviderRun* const run = milliseconds ? CurrentRun() : nullptr;
   if (run == nullptr) return;
   run->fMilliseconds = *milliseconds;
-  std::string const failure = FailureOf([&] {
-    auto const ns = TReceivedNamespace::From(std::move(fBytes), fCounts);
-    run->fView = std::make_shared<TNamespaceView>(run->fName, ns, fSampleLabel);
-  });
+  std::string const failure =
+      FailureOf([&] { run->fView = std::make_shared<TNamespaceView>(run->fName, fNamespace->Finish(), fSampleLabel); });
   if (!failure.empty()) Fail(failure);
-  fBytes = std::string();
-  fProvider.reset();
+  EndFill();
 }
 
 // A cost without a class is that of the load or the fill that is under way.
@@ -143,7 +149,12 @@ void TPlugInAnswer::Fail(std::string why, bool exceedsLimit) {
   (run != nullptr ? run->fStage : fResult.fStage) = NameOf(run != nullptr ? EStage::kFill : fStage);
   (run != nullptr ? run->fExceedsLimit : fResult.fExceedsLimit) = exceedsLimit || isOutOfMemory;
   (run != nullptr ? run->fLastLogLine : fResult.fLastLogLine) = fLastLogLine();
-  if (run != nullptr) fProvider.reset();
+  if (run != nullptr) EndFill();
+}
+
+void TPlugInAnswer::EndFill() {
+  fProvider.reset();
+  fNamespace.reset();
 }
 
 TPlugIn TPlugInAnswer::Finish(std::string words) {

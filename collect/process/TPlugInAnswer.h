@@ -4,6 +4,7 @@
 #include "collect/ApartLimits.h"
 #include "collect/PlugIns.h"
 #include "collect/answer/AnswerLimits.h"
+#include "collect/answer/TNamespaceReader.h"
 #include "collect/process/EStage.h"
 #include "collect/process/Messages.h"
 
@@ -48,9 +49,11 @@ private:
   void Take(TMessage const& message);
   void TakeName(TMessage const& message);
   void TakeLoaded(std::string const& microseconds);
+  void TakeClasses();
   void TakeNamespace(std::string const& microseconds);
   void TakeCost(std::string const& bytes);
   void TakeTrace(TMessage const& message);
+  void EndFill();
   void Begin(EStage stage);
   void Refuse(std::string why);
   std::optional<double> MillisecondsIn(std::string const& microseconds);  // refuses what is not a number
@@ -66,12 +69,12 @@ private:
   std::string fWhyBad;  // of kBad
 
   TMessageReader fMessages;
-  std::string fBytes;              // of the namespace that is being filled
   std::uint64_t fAnswerBytes = 0;  // of all namespaces
   std::uint64_t fOtherBytes = 0;   // of all other messages, and of the heads of all
   TAnswerCounts fCounts;
-  std::uint64_t fCosts = 0;  // the number of classes with a cost
-  TTraces fTraces;           // of the result when they are complete
+  std::optional<TNamespaceReader> fNamespace;  // that is being filled
+  std::uint64_t fCosts = 0;                    // the number of classes with a cost
+  TTraces fTraces;                             // of the result when they are complete
 
   EStage fStage = EStage::kOpen;
   TClock::time_point fStageBegan = TClock::now();

@@ -6,6 +6,7 @@
 #include "ICIMPropertyDecl.h"
 #include "TZEPFailure.h"
 #include "collect/answer/TBadAnswer.h"
+#include "collect/answer/TNamespaceReader.h"
 #include "collect/answer/TReceivedNamespace.h"
 #include "providers/memory/TMemoryClass.h"
 #include "tests/collect/SamplePlugIns.h"
@@ -42,6 +43,20 @@ TEST(NamespaceBytesTest, RandomNamespacesAnswerTheSameWhenReadAgain) {
 }
 
 TEST(NamespaceBytesTest, AnEmptyNamespaceIsReadAgain) { ExpectSame(TMemoryNamespace("")); }
+
+// A reader that gets the bytes in these pieces reads the classes before the instances exist.
+TEST(NamespaceBytesTest, TheFirstPieceHoldsTheClasses) {
+  for (unsigned int const seed : {1u, 2u, 3u}) {
+    auto const ns = RandomNamespace(seed);
+    TAnswerCounts counts;
+    TNamespaceReader reader(counts);
+    WriteNamespace(*ns, [&](std::string_view piece) {
+      reader.Add(piece);
+      reader.ReadClasses();
+    });
+    EXPECT_EQ(DumpOf(*reader.Finish()), DumpOf(*ns));
+  }
+}
 
 TEST(NamespaceBytesTest, InstancesAboveTheSizeOfAPieceAreSentInSeveral) {
   TMemory const ns = boost::make_shared<TMemoryNamespace>("root/many");
