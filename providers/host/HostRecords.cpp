@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "HostRecords.h"
 
-#include "RunningClock.h"
 #include "TCIMSchemaHelper.h"
+#include "providers/reasons/RunningClock.h"
 
 #include <algorithm>
 

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "RunningRecords.h"
 
-#include "RunningClock.h"
 #include "TOSSpecific.h"
+#include "providers/reasons/RunningClock.h"
 
 #include <sys/timex.h>
 #include <nlohmann/json.hpp>

@@ -2,6 +2,7 @@
 #include "SensorRecords.h"
 
 #include "ValueNames.h"
+#include "providers/reasons/TIdentifiers.h"
 
 namespace NQRVZEP20 {
 
@@ -9,7 +10,7 @@ namespace {
 
 using EKind = TSensor::EKind;
 
-constexpr std::uint16_t kOK = 2, kStressed = 4, kError = 6;
+constexpr std::uint16_t kOK = 2, kStressed = 4, kError = 6, kStopped = 10;
 
 struct TKindNumbers {
   std::uint16_t fSensorType, fBaseUnits;
@@ -50,6 +51,17 @@ TFinding<std::string> ElementNameOf(TSensor const& sensor) {
   return sensor.fLabel ? sensor.fLabel : TFinding<std::string>(NameOf(sensor));
 }
 
+struct TStatus {
+  std::uint16_t fCode;
+  std::string fText;
+};
+
+TFinding<TStatus> StatusOf(TPowerSupply const& supply) {
+  bool const isBroken = supply.fHealth && *supply.fHealth != "Good" && *supply.fHealth != "Unknown";
+  if (isBroken) return TStatus{kError, *supply.fHealth};
+  return supply.fIsOnline.Then([](bool isOnline) { return isOnline ? TStatus{kOK, "online"} : TStatus{kStopped, "offline"}; });
+}
+
 }  // namespace
 
 TRecord SensorRecord(TSensor const& sensor, TComputerSystem const& system) {
@@ -79,6 +91,23 @@ TRecord FanRecord(TSensor const& sensor, TComputerSystem const& system) {
   system.AddDeviceKeys(record, NameOf(sensor));
   record.Add("ElementName", ElementNameOf(sensor));
   record.Add("OperationalStatus", StateOf(sensor).Then(StatusFrom)).Names(kOperationalStatusNames);
+  return record;
+}
+
+TRecord PowerSupplyRecord(TPowerSupply const& supply, TComputerSystem const& system) {
+  using TCodes = std::vector<std::uint16_t>;
+  using TTexts = std::vector<std::string>;
+  auto const status = StatusOf(supply);
+  TRecord record("CIM_PowerSupply", "/sys/class/power_supply/");
+  system.AddDeviceKeys(record, supply.fName);
+  record.Add("OperationalStatus", status.Then([](TStatus const& each) { return TCodes{each.fCode}; }))
+      .Names(kOperationalStatusNames);
+  record.Add("StatusDescriptions", status.Then([](TStatus const& each) { return TTexts{each.fText}; }));
+  TIdentifiers identifiers;
+  identifiers.Add("Manufacturer", supply.fMaker);
+  identifiers.Add("Model", supply.fModel);
+  identifiers.Add("SerialNumber", supply.fSerialNumber);
+  identifiers.AddTo(record);
   return record;
 }
 

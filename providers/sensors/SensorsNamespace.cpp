@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "SensorsNamespace.h"
 
+#include "LogRecords.h"
 #include "SensorRecords.h"
 #include "TMemoryNamespace.h"
 #include "providers/reasons/TRecordWriter.h"
@@ -13,6 +14,9 @@ constexpr TAssociation kAssociatedSensor{"CIM_AssociatedSensor", "Antecedent", "
                                          "CIM_ManagedSystemElement"};
 constexpr TAssociation kElementStatisticalData{"CIM_ElementStatisticalData", "ManagedElement", "CIM_ManagedElement", "Stats",
                                                "CIM_StatisticalData"};
+
+constexpr TAssociation kUseOfLog{"CIM_UseOfLog", "Antecedent", "CIM_Log", "Dependent", "CIM_ManagedSystemElement"};
+constexpr TAssociation kLogManagesRecord{"CIM_LogManagesRecord", "Log", "CIM_Log", "Record", "CIM_RecordForLog"};
 
 using TRecords = std::vector<TRecord>;
 
@@ -41,6 +45,27 @@ void WriteSensors(TRecordWriter& writer, TMachineFiles const& files, TComputerSy
   }
 }
 
+void WritePowerSupplies(TRecordWriter& writer, TMachineFiles const& files, TComputerSystem const& system) {
+  TRecords supplies;
+  for (TPowerSupply const& each : ReadPowerSupplies(files)) supplies.push_back(PowerSupplyRecord(each, system));
+  writer.Write(PowerSupplyRecord({}, system), supplies, NoneIn("/sys/class/power_supply", "power supplies"));
+  for (TRecord const& record : supplies) writer.Associate(kSystemDevice, system.Record(), record);
+}
+
+void WriteKernelLog(TRecordWriter& writer, TMachineFiles const& files, TRecord const& system) {
+  auto const log = ReadKernelLog(files);
+  TRunningClock const clock = RunningClockOf(files);
+  TRecords logs, events;
+  if (log) logs.push_back(KernelLogRecord(*log));
+  if (log)
+    for (TKernelEvent const& event : log->fEvents) events.push_back(KernelEventRecord(event, clock));
+  writer.Write(KernelLogRecord({}), logs, log ? TMissing{} : log.Why());
+  writer.Write(KernelEventRecord({}, clock), events,
+               log ? TMissing{kMissingNotGiven, "the log of the kernel reports no error"} : log.Why());
+  for (TRecord const& each : logs) writer.Associate(kUseOfLog, each, system);
+  for (TRecord const& each : events) writer.Associate(kLogManagesRecord, logs.front(), each);
+}
+
 template <class TErrors, class TMakeRecord>
 void WriteErrors(TRecordWriter& writer, TRecord const& system, std::vector<TErrors> const& errors, TMakeRecord const& makeRecord,
                  TMissing const& whyNone) {
@@ -61,6 +86,8 @@ void FillSensorsNamespace(TMachineFiles const& files, TMemoryNamespace& ns) {
               NoneIn("/sys/devices/system/edac/mc", "memory controllers"));
   WriteErrors(writer, system.Record(), ReadPciErrors(files), PciErrorsRecord,
               {kMissingNotGiven, "the kernel counts the errors of no PCI Express device"});
+  WritePowerSupplies(writer, files, system);
+  WriteKernelLog(writer, files, system.Record());
   writer.WriteMissing();
 }
 

@@ -71,5 +71,14 @@ constexpr TValueName kOperationalStatusNames[] = {{"0", "Unknown"},
                                                   {"19", "Relocating"},
                                                   {"..", "DMTF Reserved"},
                                                   {"0x8000..", "Vendor Reserved"}};
+constexpr TValueName kOverwritePolicyNames[] = {{"0", "Unknown"},  {"2", "Wraps When Full"}, {"7", "Never Overwrites"},
+                                                {"8", "Archives"}, {"..", "DMTF Reserved"},  {"32768..65535", "Vendor Reserved"}};
+constexpr TValueName kLogStateNames[] = {{"0", "Unknown"},        {"2", "Normal"},         {"3", "Erasing"},
+                                         {"4", "Not Applicable"}, {"..", "DMTF Reserved"}, {"32768..65535", "Vendor Reserved"}};
+constexpr TValueName kPerceivedSeverityNames[] = {
+    {"0", "Unknown"}, {"1", "Other"}, {"2", "Information"}, {"3", "Degraded/Warning"},
+    {"4", "Minor"},   {"5", "Major"}, {"6", "Critical"},    {"7", "Fatal/NonRecoverable"}};
+constexpr TValueName kKindNames[] = {{"1", "Out Of Memory"}, {"2", "Processor"}, {"3", "Memory"},     {"4", "PCI Express"},
+                                     {"5", "Hardware"},      {"6", "Disk"},      {"7", "File System"}};
 
 }  // namespace NQRVZEP20

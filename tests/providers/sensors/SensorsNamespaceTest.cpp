@@ -50,6 +50,37 @@ TEST_F(SensorsNamespaceTest, ErrorsBelongToTheSystem) {
   EXPECT_THAT(text, HasSubstr("CIM_ElementStatisticalData"));
 }
 
+TEST_F(SensorsNamespaceTest, ErrorsInTheLogBelongToTheLogOfTheSystem) {
+  Write("proc/uptime", "100.5 1.0\n");
+  Write("proc/stat", "cpu 0\nbtime 1700000000\n");
+  Write("dev/kmsg", "3,7,40000001,-;critical medium error, dev sda, sector 4656\n6,8,40000002,-;fine\n");
+  Fill();
+  std::string const text = TextOf(*fNs);
+  EXPECT_THAT(text, HasSubstr("MessageTimestamp=\"20231114221400.000001+000\""));
+  EXPECT_THAT(text, HasSubstr("RecordData: critical medium error, dev sda, sector 4656"));
+  EXPECT_THAT(text, HasSubstr("Subject: sda"));
+  EXPECT_THAT(text, HasSubstr("Age: 60"));
+  EXPECT_THAT(text, HasSubstr("CurrentNumberOfRecords: 2"));
+  EXPECT_THAT(text, HasSubstr("GoneRecords: 7"));
+  EXPECT_THAT(text, HasSubstr("CIM_LogManagesRecord"));
+  EXPECT_THAT(text, HasSubstr("CIM_UseOfLog"));
+}
+
+TEST_F(SensorsNamespaceTest, ALogWithoutErrorsHasAReasonForNoRecords) {
+  Write("dev/kmsg", "6,0,1,-;fine\n");
+  Fill();
+  TReasonReader const reasons(*fNs);
+  EXPECT_EQ(reasons.WhyNoInstance("ZEP_KernelLogRecord")->fReason, "the log of the kernel reports no error");
+  EXPECT_THAT(TextOf(*fNs), HasSubstr("CurrentNumberOfRecords: 1"));
+}
+
+TEST_F(SensorsNamespaceTest, APowerSupplyHasAState) {
+  Write("sys/class/power_supply/PSU1/type", "Mains\n");
+  Write("sys/class/power_supply/PSU1/online", "0\n");
+  Fill();
+  EXPECT_THAT(TextOf(*fNs), HasSubstr("StatusDescriptions: { offline }"));
+}
+
 TEST_F(SensorsNamespaceTest, AMachineWithoutFilesHasReasons) {
   Fill();
   TReasonReader const reasons(*fNs);
@@ -57,6 +88,9 @@ TEST_F(SensorsNamespaceTest, AMachineWithoutFilesHasReasons) {
   EXPECT_EQ(reasons.WhyNoInstance("CIM_Fan")->fReason, "the kernel lists no fans in /sys/class/hwmon");
   EXPECT_EQ(reasons.WhyNoInstance("ZEP_MemoryErrors")->fReason,
             "the kernel lists no memory controllers in /sys/devices/system/edac/mc");
+  EXPECT_EQ(reasons.WhyNoInstance("CIM_PowerSupply")->fReason, "the kernel lists no power supplies in /sys/class/power_supply");
+  for (char const* name : {"ZEP_KernelLog", "ZEP_KernelLogRecord"})
+    EXPECT_EQ(reasons.WhyNoInstance(name)->fCode, kMissingUnreadable) << name;
   EXPECT_EQ(reasons.WhyNoInstance("ZEP_PCIErrors")->fReason, "the kernel counts the errors of no PCI Express device");
 }
 

@@ -30,7 +30,9 @@ TFinding<std::uint64_t> BootSeconds(TMachineFiles const& files) {
   });
 }
 
-TFinding<TCIMDateTime> DateTimeFrom(std::uint64_t secondsSince1970) {
+}  // namespace
+
+TFinding<TCIMDateTime> DateTimeFrom(std::uint64_t secondsSince1970, unsigned microSeconds) {
   auto const seconds = static_cast<std::time_t>(secondsSince1970);
   std::tm utc = {};
   if (secondsSince1970 > 253402300799 || ::gmtime_r(&seconds, &utc) == nullptr)  // the end of the year 9999
@@ -38,20 +40,19 @@ TFinding<TCIMDateTime> DateTimeFrom(std::uint64_t secondsSince1970) {
   try {
     return TCIMDateTime(static_cast<unsigned short>(utc.tm_year + 1900), static_cast<unsigned short>(utc.tm_mon + 1),
                         static_cast<unsigned>(utc.tm_mday), static_cast<unsigned short>(utc.tm_hour),
-                        static_cast<unsigned short>(utc.tm_min), static_cast<unsigned short>(utc.tm_sec), 0, 0);
+                        static_cast<unsigned short>(utc.tm_min), static_cast<unsigned short>(utc.tm_sec), microSeconds, 0);
   } catch (TZEPException const&) {
     return TMissing{kMissingUnexpected, std::to_string(secondsSince1970) + " seconds after 1970 is not a date"};
   }
 }
-
-}  // namespace
 
 TRunningClock RunningClockOf(TMachineFiles const& files) {
   auto const boot = BootSeconds(files);
   auto const uptime = files.Line("/proc/uptime").Then([](std::string const& text) { return SecondsFrom(text, "/proc/uptime"); });
   auto const now =
       boot.Then([&](std::uint64_t start) { return uptime.Then([&](std::uint64_t passed) { return start + passed; }); });
-  return {boot.Then(DateTimeFrom), now.Then(DateTimeFrom), uptime};
+  auto const dateTimeFrom = [](std::uint64_t seconds) { return DateTimeFrom(seconds); };
+  return {boot, boot.Then(dateTimeFrom), now.Then(dateTimeFrom), uptime};
 }
 
 }  // namespace NQRVZEP20

@@ -2,14 +2,18 @@
 #pragma once
 
 #include "TCIMDateTime.h"
-#include "providers/reasons/TMachineFiles.h"
+#include "TMachineFiles.h"
 
 #include <cstdint>
 
 namespace NQRVZEP20 {
 
+// A point in time in UTC. Missing if it is after the year 9999.
+TFinding<TCIMDateTime> DateTimeFrom(std::uint64_t secondsSince1970, unsigned microSeconds = 0);
+
 // When the machine was started, and the time at which its files were read. Both are in UTC, in whole seconds.
 struct TRunningClock {
+  TFinding<std::uint64_t> fBootSeconds;  // since 1970
   TFinding<TCIMDateTime> fBootTime;
   TFinding<TCIMDateTime> fTime;
   TFinding<std::uint64_t> fUptime;  // in seconds

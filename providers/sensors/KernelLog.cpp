@@ -1,0 +1,124 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "KernelLog.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <cstring>
+#include <deque>
+#include <utility>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+constexpr char const* kPath = "/dev/kmsg";
+
+// Collects the events of records that are given to it in the order of the log.
+class TCollector {
+public:
+  // `record`: the first line of the record.
+  void Add(std::string_view record) {
+    auto message = KernelMessageFrom(record);
+    if (!message) return void(++fLog.fUnreadable);
+    ++fLog.fRecords;
+    if (message->fNumber > fNext) fLog.fGone += message->fNumber - fNext;
+    fNext = message->fNumber + 1;
+    auto event = KernelEventFrom(std::move(*message));
+    if (event) Keep(std::move(*event));
+  }
+
+  bool IsFull() const { return fLog.fRecords + fLog.fUnreadable >= kMostKernelRecords; }
+
+  TKernelLog Finish(bool isWhole) {
+    fLog.fIsWhole = isWhole;
+    for (auto& events : fEvents)
+      for (TKernelEvent& event : events) fLog.fEvents.push_back(std::move(event));
+    std::stable_sort(fLog.fEvents.begin(), fLog.fEvents.end(), [](TKernelEvent const& one, TKernelEvent const& other) {
+      return one.fMessage.fNumber < other.fMessage.fNumber;
+    });
+    return std::move(fLog);
+  }
+
+private:
+  void Keep(TKernelEvent event) {
+    auto& events = fEvents.at(event.fKind - 1);
+    events.push_back(std::move(event));
+    if (events.size() <= kMostKernelEvents) return;
+    events.pop_front();
+    ++fLog.fLeftOut;
+  }
+
+  TKernelLog fLog;
+  std::uint64_t fNext = 0;  // the number that the next record has if none was overwritten
+  std::array<std::deque<TKernelEvent>, TKernelEvent::kKinds> fEvents;
+};
+
+class TDevice {
+public:
+  TDevice() : fFd(::open(kPath, O_RDONLY | O_NONBLOCK | O_CLOEXEC | O_NOCTTY)) {}
+  TDevice(TDevice const&) = delete;
+  TDevice& operator=(TDevice const&) = delete;
+  ~TDevice() {
+    if (fFd >= 0) ::close(fFd);
+  }
+  int Get() const { return fFd; }
+
+private:
+  int const fFd;
+};
+
+// A reason, also if the system has no such device: then errors in the log are unknown.
+TMissing WhyUnreadable(int error) {
+  if (error == ENOENT) return {kMissingUnreadable, "/dev/kmsg does not exist, as in most containers"};
+  if ((error == EACCES || error == EPERM) && ::geteuid() != 0) return {kMissingNeedsRoot, "only root may read /dev/kmsg"};
+  return {kMissingUnreadable, std::string("/dev/kmsg cannot be read: ") + std::strerror(error)};
+}
+
+std::string_view FirstLine(std::string_view text) { return text.substr(0, text.find('\n')); }
+
+// Each read returns one record. EPIPE: the next record was overwritten meanwhile, and reading goes on after the gap.
+TFinding<TKernelLog> ReadDevice() {
+  TDevice const device;
+  if (device.Get() < 0) return WhyUnreadable(errno);
+  ::lseek(device.Get(), 0, SEEK_DATA);  // after the last clearing; otherwise reading begins at the oldest record
+  TCollector log;
+  std::string buffer(8192, '\0');  // the kernel's longest record
+  std::size_t bytes = 0;
+  while (!log.IsFull() && bytes < kMostKernelBytes) {
+    ssize_t const size = ::read(device.Get(), buffer.data(), buffer.size());
+    if (size > 0) {
+      log.Add(FirstLine({buffer.data(), static_cast<std::size_t>(size)}));
+      bytes += static_cast<std::size_t>(size);
+    } else if (size == 0 || errno == EAGAIN) {
+      return log.Finish(true);
+    } else if (errno != EPIPE && errno != EINTR) {
+      return WhyUnreadable(errno);
+    }
+  }
+  return log.Finish(false);
+}
+
+}  // namespace
+
+TFinding<TKernelLog> ReadKernelLog(TMachineFiles const& files) {
+  if (files.IsThisMachine()) return ReadDevice();
+  auto const records = files.Content(kPath, kMostKernelBytes);
+  if (!records && records.Why().fCode == kMissingNotGiven) return WhyUnreadable(ENOENT);
+  return records.Then(KernelLogFrom);
+}
+
+TKernelLog KernelLogFrom(std::string_view records) {
+  TCollector log;
+  while (!records.empty() && !log.IsFull()) {
+    std::string_view const line = FirstLine(records);
+    if (!line.empty() && line.front() != ' ') log.Add(line);
+    records.remove_prefix(std::min(line.size() + 1, records.size()));
+  }
+  return log.Finish(records.empty());
+}
+
+}  // namespace NQRVZEP20
