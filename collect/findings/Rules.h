@@ -13,6 +13,7 @@ std::vector<TRule> FileSystemRules();
 std::vector<TRule> NetworkRules();
 std::vector<TRule> DeviceRules();
 std::vector<TRule> SensorRules();
+std::vector<TRule> LogRules();
 std::vector<TRule> HostRules();
 std::vector<TRule> SystemRules();
 

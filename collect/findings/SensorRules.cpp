@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/findings/Rules.h"
 
+#include <algorithm>
+
 namespace NQRVZEP20 {
 
 namespace {
@@ -41,6 +43,29 @@ void AskFans(TRuleRun& run) {
   }
 }
 
+// A supply without power is lost only if another one has power: a machine with a battery may do without.
+void AskPowerSupplies(TRuleRun& run) {
+  constexpr char const *ok = "2", *failed = "6", *stopped = "10";
+  auto const statusOf = [](TElement const& supply) {
+    auto const status = supply.Texts("OperationalStatus");
+    return status.IsKnown() && !status.fValue->empty() ? status.fValue->front() : "";
+  };
+  auto const supplies = run.Elements("CIM_PowerSupply");
+  bool const hasPower =
+      std::any_of(supplies.begin(), supplies.end(), [&](TElement const& supply) { return statusOf(supply) == ok; });
+  for (TElement const& supply : supplies) {
+    auto const status = supply.Texts("OperationalStatus");
+    if (!run.Know(supply, status)) continue;
+    std::string const code = statusOf(supply);
+    if (code == failed)
+      run.Add(supply, status.fSource, ESeverity::kError, "the power supply " + supply.Label() + " has failed",
+              "Replace the power supply.");
+    else if (code == stopped && hasPower)
+      run.Add(supply, status.fSource, ESeverity::kError, "the power supply " + supply.Label() + " has no power",
+              "Check its cable and the circuit that it is connected to; replace it if they are well.");
+  }
+}
+
 void AskMemoryErrors(TRuleRun& run) {
   for (TElement const& errors : run.Elements("ZEP_MemoryErrors")) {
     auto const corrected = errors.Number("CorrectedErrors"), uncorrected = errors.Number("UncorrectedErrors");
@@ -74,6 +99,7 @@ void AskPciErrors(TRuleRun& run) {
 std::vector<TRule> SensorRules() {
   return {{"sensor-threshold", "Is a sensor beyond its threshold?", AskSensors},
           {"fan-stopped", "Has a fan stopped?", AskFans},
+          {"power-supply-lost", "Has a power supply failed or lost its power?", AskPowerSupplies},
           {"memory-errors", "Has the memory had errors?", AskMemoryErrors},
           {"pci-errors", "Has a PCI Express device had errors?", AskPciErrors}};
 }

@@ -23,6 +23,7 @@ constexpr TSetting kSettings[] = {
     {"finding-port-errors-per-million", &TThresholds::fPortErrorsPerMillion, 1000000},
     {"finding-corrected-memory-errors", &TThresholds::fCorrectedMemoryErrors, 1000000000},
     {"finding-corrected-pci-errors", &TThresholds::fCorrectedPciErrors, 1000000000},
+    {"finding-kernel-log-days", &TThresholds::fKernelLogDays, 1000000},
     {"finding-clock-grace-minutes", &TThresholds::fClockGraceMinutes, 1000000},
 };
 

@@ -19,6 +19,7 @@ struct TThresholds {
   std::uint64_t fPortErrorsPerMillion = 10;    // packets
   std::uint64_t fCorrectedMemoryErrors = 100;  // of a memory module
   std::uint64_t fCorrectedPciErrors = 1000;    // of a PCI Express device
+  std::uint64_t fKernelLogDays = 7;            // after which a record of the kernel's log is no longer judged
   std::uint64_t fClockGraceMinutes = 15;       // after the start, in which the clock need not be synchronised
 
   // The defaults, replaced by the settings that the callback has: it gets a key such as "finding-file-system-free-percent" and

@@ -2,91 +2,15 @@
 
 // Each rule with instances that have a problem, that are fine, and that cannot be judged.
 
-#include "collect/findings/Findings.h"
-
-#include "TMemoryNamespace.h"
-#include "providers/mof/Mof.h"
-#include "tests/Support.h"
+#include "tests/collect/findings/FindingsOf.h"
 
 #include <gmock/gmock.h>
-#include <boost/make_shared.hpp>
 
 namespace NQRVZEP20 {
 namespace {
 
 using testing::ElementsAre;
 using testing::IsEmpty;
-
-// The classes that the rules read, with the properties that they use.
-constexpr char const* kClasses = R"(
-  Qualifier Description : string, Scope(any);
-  Qualifier ValueMap : string[], Scope(property);
-  class CIM_ManagedElement {};
-  Qualifier Key : boolean = false, Scope(property, reference), Flavor(DisableOverride);
-  Qualifier Association : boolean = false, Scope(association), Flavor(DisableOverride);
-  class CIM_MediaAccessDevice { [key] string DeviceID; uint16 OperationalStatus[]; string StatusDescriptions[]; };
-  class CIM_DiskDrive : CIM_MediaAccessDevice { uint16 HealthState; };
-  class ZEP_DiskHealth { [key] string InstanceID; string ElementName; uint8 PercentageUsed; uint8 AvailableSpare;
-    uint8 AvailableSpareThreshold; uint64 PendingSectors; uint64 UncorrectableErrors; uint64 ReallocatedSectors; };
-  class ZEP_RaidArray { [key] string DeviceID; string State; uint16 Members; uint16 MissingMembers; string Action;
-    uint16 PackageRedundancy; };
-  class CIM_LocalFileSystem { [key] string Name; string Root; string FileSystemType; boolean ReadOnly; uint64 FileSystemSize;
-    uint64 AvailableSpace; };
-  class CIM_UnixLocalFileSystem : CIM_LocalFileSystem { uint64 TotalInodes; uint64 FreeInodes; };
-  class ZEP_Mount { [key] string InstanceID; string ElementName; string Type; string Options; string FileSystemOptions; };
-  class ZEP_InterfaceStatistics { [key] string InstanceID; string ElementName; uint64 ReceiveErrors; uint64 TransmitErrors;
-    uint64 PacketsReceived; uint64 PacketsTransmitted; };
-  class CIM_EthernetPort { [key] string DeviceID; uint16 EnabledState; uint16 OperationalStatus[]; boolean FullDuplex;
-    uint64 Speed; uint64 MaxSpeed; };
-  class CIM_IPProtocolEndpoint { [key] string Name; string InterfaceName; uint16 AddressOrigin; };
-  class ZEP_BridgePort { [key] string Name; string ElementName; };
-  class ZEP_BondMember { [key] string Name; string ElementName; string BondName; string MIIStatus; };
-  class ZEP_Bond { [key] string InstanceID; string ElementName; uint32 NumberOfMembers; };
-  class CIM_PCIDevice { [key] string DeviceID; uint8 ClassCode; };
-  class ZEP_PCIExpressLink { [key] string DeviceID; uint16 Width; uint16 MaxWidth; real32 TransferRate; real32 MaxTransferRate; };
-  [association] class CIM_ControlledBy { [key] CIM_PCIDevice ref Antecedent; [key] CIM_PCIDevice ref Dependent; };
-  class CIM_NumericSensor { [key] string DeviceID; string ElementName; uint16 SensorType; string CurrentState;
-    sint32 CurrentReading; };
-  class ZEP_MemoryErrors { [key] string InstanceID; string ElementName; uint64 CorrectedErrors; uint64 UncorrectedErrors; };
-  class ZEP_PCIErrors { [key] string InstanceID; string ElementName; uint64 CorrectableErrors; uint64 NonFatalErrors;
-    uint64 FatalErrors; };
-  class CIM_Processor { [key] string DeviceID; string ElementName; string Stepping; };
-  class ZEP_ProcessorSettings { [key] string InstanceID; string MicrocodeVersion; };
-  class CIM_PhysicalMemory { [key] string Tag; string ElementName; string BankLabel; uint64 Capacity; uint16 MemoryType;
-    uint32 MaxMemorySpeed; };
-  class ZEP_Virtualization { [key] string InstanceID; boolean IsVirtual; };
-  class ZEP_ProcessorWeakness { [key] string Name; uint16 State; };
-  class ZEP_RunningState { [key] string InstanceID; uint64 Uptime; boolean ClockSynchronized; uint64 Taint; string FailedUnits[]; };
-)";
-
-TFindings FindingsOf(std::string const& instances, TThresholds const& thresholds = {}) {
-  auto const ns = boost::make_shared<TMemoryNamespace>("root/test");
-  ReadMofText(kClasses, "classes", ns);
-  ReadMofFile(SourcePath("collect/findings/ZEP_Finding.mof"), ns);
-  ReadMofText(instances, "instances", ns);
-  return MakeFindings({TNamespaceView("Test", ns)}, thresholds);
-}
-
-// The problems that the rule finds, as "severity: reason".
-std::vector<std::string> Problems(std::string const& rule, std::string const& instances, TThresholds const& thresholds = {}) {
-  std::vector<std::string> texts;
-  for (TProblem const& problem : FindingsOf(instances, thresholds).fProblems) {
-    EXPECT_FALSE(problem.fRemedy.empty()) << problem.fReason;
-    if (problem.fRule == rule) texts.push_back(NameOf(problem.fSeverity) + ": " + problem.fReason);
-  }
-  return texts;
-}
-
-TRuleResult ResultOf(std::string const& rule, TFindings const& findings) {
-  for (TRuleResult const& result : findings.fRules)
-    if (result.fId == rule) return result;
-  ADD_FAILURE() << "no rule " << rule;
-  return {};
-}
-
-std::string Outcome(std::string const& rule, std::string const& instances) {
-  return NameOf(ResultOf(rule, FindingsOf(instances)).fOutcome);
-}
 
 // ---- Disks ----
 
@@ -306,6 +230,20 @@ TEST(RulesTest, AFanThatDoesNotTurnAlthoughItShouldIsNamed) {
   EXPECT_THAT(Problems(rule, Sensor(kFan, "Fault", 900)), ElementsAre(reason));
   EXPECT_THAT(Problems(rule, Sensor(kFan, "Normal", 0)), IsEmpty()) << "it has no lowest speed: it may stand still";
   EXPECT_THAT(Problems(rule, Sensor(kFan, "Lower Non-Critical", 200)), IsEmpty());
+}
+
+std::string Supply(char const* name, char const* status) {
+  return std::string("instance of CIM_PowerSupply { DeviceID = \"") + name + "\"; OperationalStatus = " + status + "; };";
+}
+
+TEST(RulesTest, APowerSupplyIsLostIfAnotherOneHasPower) {
+  std::string const rule = "power-supply-lost";
+  EXPECT_THAT(Problems(rule, Supply("PS1", "{2}") + Supply("PS2", "{10}")),
+              ElementsAre("error: the power supply PS2 has no power"));
+  EXPECT_THAT(Problems(rule, Supply("PS1", "{6}")), ElementsAre("error: the power supply PS1 has failed"));
+  EXPECT_THAT(Problems(rule, Supply("PS1", "{2}") + Supply("PS2", "{2}")), IsEmpty());
+  EXPECT_THAT(Problems(rule, Supply("ACAD", "{10}")), IsEmpty()) << "a notebook runs on its battery";
+  EXPECT_EQ(Outcome(rule, Supply("PS1", "NULL")), "not-asked");
 }
 
 TEST(RulesTest, ErrorsOfMemoryAndPciDevicesAreCounted) {
