@@ -111,6 +111,18 @@ void HarmSupervisor(int signal) {
   HangHere();
 }
 
+// The parent of the supervisor.
+pid_t Owner() {
+  std::ifstream status("/proc/" + std::to_string(::getppid()) + "/status");
+  for (std::string word; status >> word;)
+    if (word == "PPid:") {
+      pid_t owner = 0;
+      status >> owner;
+      return owner;
+    }
+  throw std::runtime_error("its supervisor has no parent");
+}
+
 void TraceSupervisor() {
   StartDaemon(OwnName());
   if (::ptrace(PTRACE_ATTACH, ::getppid(), nullptr, nullptr) != 0) throw std::runtime_error("it may not trace its supervisor");
@@ -344,6 +356,8 @@ std::map<std::string, TMisdeed> const kWhileFilling = {
     {"StopsItsSupervisor", [] { HarmSupervisor(SIGSTOP); }},
     {"StopsItsSupervisorAndReturns", [] { ::kill(::getppid(), SIGSTOP); }},
     {"TracesItsSupervisor", TraceSupervisor},
+    {"StopsItsOwner", [] { ::kill(Owner(), SIGSTOP); }},
+    {"KillsItsOwner", [] { StartDaemon("KillsItsOwner"), ::kill(Owner(), SIGKILL), HangHere(); }},
     {"TerminatesAndExits", [] { TerminateWith([] { std::exit(5); }); }},
     {"TerminatesAndReturns", [] { TerminateWith([] {}); }},
     {"TerminatesAndHangs", [] { TerminateWith([] { HangHere(); }); }},

@@ -70,6 +70,16 @@ protected:
     EXPECT_FALSE(fs::exists("/proc/" + id)) << file;
   }
 
+  // The output is lost.
+  pid_t StartReport() const {
+    pid_t const zep = ::fork();
+    if (zep != 0) return zep;
+    for (auto const& [name, value] : Environment()) ::setenv(name.c_str(), value.c_str(), 1);
+    [[maybe_unused]] bool const isLost = std::freopen("/dev/null", "w", stdout) != nullptr;
+    ::execl(fZep.Path("bin/zep").c_str(), "zep", "report", nullptr);
+    ::_exit(127);
+  }
+
   TInstallation fZep;
 };
 
@@ -108,7 +118,10 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
   } const rows[] = {
       {"Throws", "fill", "kZEPStatusAccessDenied (no disk)", "[Error] the disk is gone"},
       {"ThrowsInAThread", "fill", "in a thread", nullptr},
+      {"ThrowsWhileItMayNot", "fill", "it may not", nullptr},
       {"Crashes", "fill", "it was killed by SIGSEGV (Segmentation fault)", "[Error] about to crash"},
+      {"CrashesAfterWords", "fill", "it was killed by SIGSEGV (Segmentation fault)", nullptr},
+      {"SaysDone", "fill", "not filled, because it was registered after the plug-in had been loaded", nullptr},
       {"Aborts", "fill", "it was killed by SIGABRT (Aborted)", nullptr},
       {"Exits", "fill", "it exited with status 0", nullptr},
       {"ExitsQuickly", "fill", "it exited with status 4", nullptr},
@@ -125,6 +138,9 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
       {"Executes", "fill", "it exited with status 9", nullptr},
       {"Closes", "fill", "it closed the descriptor for its result", nullptr},
       {"LoadThrows", "static construction", "no disk today", nullptr},
+      {"LoadThrowsANumber", "static construction", "it threw an object that is not a std::exception", nullptr},
+      {"LoadAborts", "static construction", "it was killed by SIGABRT (Aborted)", nullptr},
+      {"LoadCloses", "static construction", "it closed the descriptor for its result", nullptr},
       {"LoadCrashes", "static construction", "it was killed by SIGSEGV (Segmentation fault)", nullptr},
       {"LoadExits", "static construction", "it exited with status 3", nullptr},
       {"RegistrationThrows", "registration", "it has no name", nullptr},
@@ -132,13 +148,14 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
   };
   for (TRow const& row : rows) Add({row.fName});
   std::vector<std::string> const harmless = {
-      "ChangesDirectory",      "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken", "LeavesThrowingStatic",
-      "ProviderThrowsAtItsEnd"};
+      "ChangesDirectory",     "LimitsItself",          "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken",
+      "LeavesThrowingStatic", "ProviderThrowsAtItsEnd"};
   Add(harmless);
   TRun const run = Run({"report", "--json"});
   EXPECT_EQ(run.fStatus, 2);
   auto const document = JsonOf(run);
   EXPECT_EQ(document["identity"]["serialNumber"]["value"], "KQ12345");
+  EXPECT_EQ(document["identity"]["hostName"]["value"], "db1");
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.fName);
     auto const failure = FailureIn(document, row.fName);
@@ -181,6 +198,53 @@ TEST_F(ProvidersTest, AFailureThatIsHardToReportLeavesOtherPlugInsAlone) {
   }
 }
 
+TEST_F(ProvidersTest, APlugInThatTheLinkerRefusesFailsWhenItIsOpened) {
+  fZep.Add("libLacks.nsp.so", LACKS_SYMBOL);
+  TRun const run = Run({"report", "--json"});
+  EXPECT_EQ(run.fStatus, 2);
+  auto const failure = FailureIn(JsonOf(run), "Lacks");
+  EXPECT_EQ(failure["stage"], "open");
+  EXPECT_THAT(failure["error"].get<std::string>(), HasSubstr("undefined symbol: "));
+  EXPECT_EQ(fs::path(failure["file"].get<std::string>()).filename(), "libLacks.nsp.so");
+  EXPECT_EQ(JsonOf(run)["identity"]["serialNumber"]["value"], "KQ12345");
+}
+
+TEST_F(ProvidersTest, ThePrintedLinesOfAPlugInAreShownAsItsOwn) {
+  Add({"Prints", "PrintsMuch", "CrashesAfterWords", "Reads"});
+  TRun const run = Run({"report", "--json"});
+  EXPECT_EQ(run.fStatus, 2);
+  auto const words = [document = JsonOf(run)](std::string const& name) {
+    for (auto const& plugIn : document["plugIns"])
+      if (plugIn["name"] == name) return plugIn["words"].get<std::string>();
+    return std::string();
+  };
+  EXPECT_EQ(words("Prints"), "words of 17 bytes\nand more\n");
+  EXPECT_EQ(words("CrashesAfterWords"), "last words\n");
+  EXPECT_EQ(words("Reads"), "read -1\n");
+  EXPECT_EQ(words("PrintsMuch").rfind("line 0\nline 1\n", 0), 0u);
+  EXPECT_THAT(words("PrintsMuch"), AllOf(HasSubstr(" bytes omitted]\n"), HasSubstr("line 99999\n")));
+  EXPECT_LT(words("PrintsMuch").size(), 9000u);
+  EXPECT_THAT(run.fErrors, AllOf(HasSubstr("zep: plug-in CrashesAfterWords printed: last words\n"),
+                                 HasSubstr("zep: plug-in PrintsMuch printed: line 99999\n")));
+}
+
+TEST_F(ProvidersTest, ALongErrorAndALongLogLineAreCut) {
+  Add({"LogsMuch"});
+  TRun const run = Run({"report", "--json"});
+  EXPECT_EQ(run.fStatus, 2);
+  auto const failure = FailureIn(JsonOf(run), "LogsMuch");
+  EXPECT_EQ(failure["error"], std::string(1021, 'y') + "...");
+  EXPECT_EQ(failure["lastLogLine"].get<std::string>().size(), 1024u);
+}
+
+TEST_F(ProvidersTest, AProviderThatIsRegisteredWhileAnotherOneFillsIsNamed) {
+  Add({"RegistersLate"});
+  TRun const run = Run({"report", "--json"});
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_THAT(JsonOf(run)["reason"].get<std::string>(),
+              HasSubstr("not filled, because it was registered after the plug-in had been loaded"));
+}
+
 TEST_F(ProvidersTest, ANameThatIsNotUtf8IsShownWithReplacements) {
   Add({"HasAnOddName"});
   TRun const run = Run({"report", "--json"});
@@ -210,6 +274,15 @@ TEST_F(ProvidersTest, OfTwoPlugInsWithOneNameBothAreNamed) {
   EXPECT_EQ(second["error"], "the name Twin is already registered by libTwinA.nsp.so");
   EXPECT_EQ(second["stage"], "registration");
   EXPECT_THAT(JsonOf(run)["reason"].get<std::string>(), HasSubstr("libTwinB.nsp.so"));
+}
+
+TEST_F(ProvidersTest, OfTwoPlugInsWithOneNameTheSecondCountsWhenTheFirstFails) {
+  Add({"TwinThrows", "TwinZ"});
+  TRun const run = Run({"report", "--json"});
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_EQ(FailureIn(JsonOf(run), "TwinThrows")["error"],
+            "no twin today; the name Twin is then registered by libTwinZ.nsp.so, which is used instead");
+  EXPECT_TRUE(FailureIn(JsonOf(run), "TwinZ")["error"].is_null());
 }
 
 TEST_F(ProvidersTest, NoCoreDumpOfAPlugInIsLeft) {
@@ -244,9 +317,9 @@ TEST_F(ProvidersTest, TheRowOfAFailureNamesFileProviderStageCauseAndLogLine) {
 
 TEST_F(ProvidersTest, PlugInsThatHangOrStopAreEndedAtTheTimeLimit) {
   fZep.Remove("libHost.nsp.so");
-  Add({"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs", "IsTraced"});
+  Add({"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs", "IsTraced", "SaysLoaded"});
   auto const document = JsonOf(Run({"report", "--json", "--plugin-timeout", "6"}));
-  for (char const* name : {"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs", "IsTraced"})
+  for (char const* name : {"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs", "IsTraced", "SaysLoaded"})
     EXPECT_EQ(FailureIn(document, name)["error"], "it exceeded the time limit of 6 s") << name;
   EXPECT_EQ(FailureIn(document, "LoadHangs")["stage"], "static construction");
   EXPECT_EQ(FailureIn(document, "RegistrationHangs")["stage"], "registration");
@@ -344,18 +417,33 @@ TEST_F(ProvidersTest, AnEndlessAnswerIsCutOff) {
 
 TEST_F(ProvidersTest, AnInterruptLeavesNoProcess) {
   Add({"Hangs"});
-  pid_t const zep = ::fork();
-  if (zep == 0) {
-    for (auto const& [name, value] : Environment()) ::setenv(name.c_str(), value.c_str(), 1);
-    ::execl(fZep.Path("bin/zep").c_str(), "zep", "report", nullptr);
-    ::_exit(127);
-  }
+  pid_t const zep = StartReport();
   WaitFor("Hangs");
   ::kill(zep, SIGINT);
   int status = 0;
   ::waitpid(zep, &status, 0);
   EXPECT_TRUE(WIFSIGNALED(status) && WTERMSIG(status) == SIGINT);
   ExpectNoProcess("Hangs");
+}
+
+TEST_F(ProvidersTest, APlugInThatKillsZepLeavesNoProcess) {
+  Add({"KillsItsOwner"});
+  int status = 0;
+  ::waitpid(StartReport(), &status, 0);
+  EXPECT_TRUE(WIFSIGNALED(status) && WTERMSIG(status) == SIGKILL);
+  ExpectNoProcess("KillsItsOwner");
+}
+
+// As after Ctrl-Z: zep continues where it was stopped.
+TEST_F(ProvidersTest, ZepThatAPlugInStopsContinues) {
+  Add({"StopsItsOwner"});
+  pid_t const zep = StartReport();
+  int status = 0;
+  ::waitpid(zep, &status, WUNTRACED);
+  ASSERT_TRUE(WIFSTOPPED(status));
+  ::kill(zep, SIGCONT);
+  ::waitpid(zep, &status, 0);
+  EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0);
 }
 
 // What the shell command of zep writes to a terminal.
