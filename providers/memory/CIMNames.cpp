@@ -28,7 +28,8 @@ void RequireCIMName(std::string const& text) {
 }
 
 bool IsSameName(std::string_view a, std::string_view b) {
-  return a.size() == b.size() && std::equal(a.begin(), a.end(), b.begin(), [](char x, char y) { return Fold(x) == Fold(y); });
+  return a.size() == b.size() &&
+         std::equal(a.begin(), a.end(), b.begin(), [](char x, char y) { return x == y || Fold(x) == Fold(y); });
 }
 
 std::string FoldName(std::string name) {
