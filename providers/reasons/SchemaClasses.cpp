@@ -13,6 +13,7 @@ constexpr TSchemaClass kClasses[] = {
     {"CIM_ATAPort", "CIM_LogicalPort", TSchemaClass::kConcrete},
     {"CIM_AbstractBasedOn", "CIM_Dependency", TSchemaClass::kAbstractAssociation},
     {"CIM_AbstractElementAllocatedFromPool", "CIM_Dependency", TSchemaClass::kAbstractAssociation},
+    {"CIM_Account", "CIM_EnabledLogicalElement", TSchemaClass::kConcrete},
     {"CIM_AllocatedFromStoragePool", "CIM_ElementAllocatedFromPool", TSchemaClass::kAssociation},
     {"CIM_AllocatedLogicalElement", "CIM_EnabledLogicalElement", TSchemaClass::kAbstract},
     {"CIM_AssociatedCacheMemory", "CIM_AssociatedMemory", TSchemaClass::kAssociation},

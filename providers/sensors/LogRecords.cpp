@@ -1,11 +1,14 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "LogRecords.h"
 
-#include "ValueNames.h"
+#include "providers/reasons/SensorValueNames.h"
 
 namespace NQRVZEP20 {
 
 namespace {
+
+constexpr TValueName kKindNames[] = {{"1", "Out Of Memory"}, {"2", "Processor"}, {"3", "Memory"},     {"4", "PCI Express"},
+                                     {"5", "Hardware"},      {"6", "Disk"},      {"7", "File System"}};
 
 constexpr char const *kLogClass = "ZEP_KernelLog", *kLogName = "kernel", *kSource = "/dev/kmsg";
 constexpr std::uint64_t kMicro = 1000000;

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "SensorRecords.h"
 
-#include "ValueNames.h"
+#include "providers/reasons/SensorValueNames.h"
 #include "providers/reasons/TIdentifiers.h"
 
 namespace NQRVZEP20 {

@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// The names that the DMTF schema gives to the numbers of enumerated properties.
+// The names that the DMTF schema gives to the numbers of enumerated properties of sensors and logs.
 
-#include "providers/reasons/TRecord.h"
+#include "TRecord.h"
 
 namespace NQRVZEP20 {
 
@@ -78,7 +78,5 @@ constexpr TValueName kLogStateNames[] = {{"0", "Unknown"},        {"2", "Normal"
 constexpr TValueName kPerceivedSeverityNames[] = {
     {"0", "Unknown"}, {"1", "Other"}, {"2", "Information"}, {"3", "Degraded/Warning"},
     {"4", "Minor"},   {"5", "Major"}, {"6", "Critical"},    {"7", "Fatal/NonRecoverable"}};
-constexpr TValueName kKindNames[] = {{"1", "Out Of Memory"}, {"2", "Processor"}, {"3", "Memory"},     {"4", "PCI Express"},
-                                     {"5", "Hardware"},      {"6", "Disk"},      {"7", "File System"}};
 
 }  // namespace NQRVZEP20

@@ -1,0 +1,61 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "Connections.h"
+
+#include "IpmiText.h"
+
+#include <array>
+#include <memory>
+#include <optional>
+#include <utility>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+using TClock = std::chrono::steady_clock;
+
+std::string FileOf(TIpmiRequest const& request) {
+  std::string const bytes = {static_cast<char>(request.fNetFn), static_cast<char>(request.fCommand)};
+  return "ipmi/" + HexText(bytes) + "-" + HexText(request.fData);
+}
+
+// Keeps the reason why no further command is sent.
+struct TLimit {
+  TIpmi fIpmi;
+  TClock::time_point fEnd;
+  std::optional<TMissing> fWhyNot = std::nullopt;
+
+  TFinding<std::string> Send(TIpmiRequest const& request) {
+    if (!fWhyNot && TClock::now() >= fEnd)
+      fWhyNot = TMissing{kMissingTimeIsUp, "the time limit for reading the controller had expired"};
+    if (fWhyNot) return *fWhyNot;
+    auto answer = fIpmi(request);
+    if (!answer) fWhyNot = answer.Why();
+    return answer;
+  }
+};
+
+}  // namespace
+
+TIpmi SessionConnection(TZepController const& controller) {
+  return [send = controller.fSend](TIpmiRequest const& request) -> TFinding<std::string> {
+    std::array<unsigned char, kZepControllerAnswerSize> answer = {};
+    unsigned const length = send(request.fNetFn, request.fCommand, reinterpret_cast<unsigned char const*>(request.fData.data()),
+                                 static_cast<unsigned>(request.fData.size()), answer.data());
+    if (length == 0 || length > answer.size()) return TMissing{kMissingNoAnswer, "the controller did not answer a command"};
+    return std::string(reinterpret_cast<char const*>(answer.data()), length);
+  };
+}
+
+TIpmi WithinTime(TIpmi ipmi, TClock::duration limit) {
+  auto const state = std::make_shared<TLimit>(TLimit{std::move(ipmi), TClock::now() + limit});
+  return [state](TIpmiRequest const& request) { return state->Send(request); };
+}
+
+TIpmi Recorded(TIpmi ipmi, TMachineFiles const& files) {
+  return [ipmi = std::move(ipmi), files](TIpmiRequest const& request) {
+    return files.Answer(FileOf(request), [&] { return ipmi(request); });
+  };
+}
+
+}  // namespace NQRVZEP20

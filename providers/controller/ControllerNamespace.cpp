@@ -1,0 +1,138 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "ControllerNamespace.h"
+
+#include "ControllerRecords.h"
+#include "TMemoryNamespace.h"
+#include "providers/reasons/TRecordWriter.h"
+
+#include <algorithm>
+#include <set>
+#include <tuple>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+using TRecords = std::vector<TRecord>;
+
+TMissing WhyNone(TFinding<bool> const& isComplete, char const* reason) {
+  return isComplete ? TMissing{kMissingNotGiven, reason} : isComplete.Why();
+}
+
+template <class TElements>
+TMissing WhyNone(TFinding<TElements> const& elements, char const* reason) {
+  return elements ? TMissing{kMissingNotGiven, reason} : elements.Why();
+}
+
+template <class TElement, class TMakeRecord>
+void WriteAll(TRecordWriter& writer, TFinding<std::vector<TElement>> const& elements, TMakeRecord const& makeRecord,
+              char const* whyNone) {
+  TRecords records;
+  if (elements)
+    for (TElement const& element : *elements) records.push_back(makeRecord(element));
+  writer.Write(makeRecord(TElement()), records, WhyNone(elements, whyNone));
+}
+
+// A sensor that several records describe has one instance.
+void WriteSensors(TRecordWriter& writer, TController const& controller, TComputerSystem const& system) {
+  std::set<std::pair<int, int>> seen;
+  TRecords withStates, withNumbers;
+  for (TSensorState const& state : controller.fSensors) {
+    if (!seen.insert({state.fSensor.fOwner, state.fSensor.fNumber}).second) continue;
+    if (state.fSensor.fScale.HasNumber())
+      withNumbers.push_back(NumericSensorRecord(state, system));
+    else
+      withStates.push_back(StateSensorRecord(state, system));
+  }
+  TSensorState const shape{};
+  TMissing const whyNone = WhyNone(controller.fHasAllRecords, "the controller has no such sensors");
+  writer.Write(StateSensorRecord(shape, system), withStates, whyNone);
+  writer.Write(NumericSensorRecord(shape, system), withNumbers, whyNone);
+  for (TRecords const* const records : {&withStates, &withNumbers})
+    for (TRecord const& record : *records) writer.Associate(kSystemDevice, system.Record(), record);
+}
+
+void WritePackages(TRecordWriter& writer, TController const& controller) {
+  std::set<std::uint8_t> seen;
+  TRecords records;
+  TMissing whyNone{kMissingNotGiven, "the controller has no FRU data"};
+  for (TFruDevice const& device : controller.fFrus) {
+    if (!device.fAreas) whyNone = device.fAreas.Why();
+    if (!device.fAreas || !seen.insert(device.fNumber).second) continue;
+    for (TFruArea const& area : *device.fAreas) records.push_back(PackageRecord(device, area));
+  }
+  writer.Write(PackageRecord({}, {}), records, whyNone);
+}
+
+// What an event and the later end of its state have in common.
+auto StateOf(TSelEntry const& entry) {
+  return std::make_tuple(entry.fOwner, entry.fSensorType, entry.fSensorNumber, entry.fEventType, entry.fData[0] & 0x0F);
+}
+
+TSdrSensor const* SensorOf(TSelEntry const& entry, std::vector<TSensorState> const& sensors) {
+  auto const found = std::find_if(sensors.begin(), sensors.end(), [&](TSensorState const& state) {
+    return state.fSensor.fOwner == entry.fOwner && state.fSensor.fNumber == entry.fSensorNumber;
+  });
+  bool const isEvent = entry.fKind == TSelEntry::EKind::kEvent;
+  return isEvent && found != sensors.end() ? &found->fSensor : nullptr;
+}
+
+TFinding<std::uint64_t> AgeOf(TSelEntry const& entry, TFinding<std::uint64_t> const& clock) {
+  TSelTime const time = SelTimeFrom(entry.fTime);
+  if (time.fKind != TSelTime::EKind::kDate)
+    return TMissing{kMissingNotGiven, "the entry has no date: the clock of the controller was not set"};
+  return clock.Then([&](std::uint64_t now) -> TFinding<std::uint64_t> {
+    if (now >= time.fSeconds) return now - time.fSeconds;
+    return TMissing{kMissingUnexpected, "the entry is later than the clock of the controller"};
+  });
+}
+
+// From the newest to the oldest, so that the ends of states come first.
+std::vector<TLoggedEvent> EventsOf(TEventLog const& log, std::vector<TSensorState> const& sensors) {
+  std::vector<TLoggedEvent> events;
+  std::set<decltype(StateOf(TSelEntry()))> ended;
+  std::set<std::uint16_t> seen;
+  std::for_each(log.fEntries.rbegin(), log.fEntries.rend(), [&](TSelEntry const& entry) {
+    if (entry.fIsDeasserted) ended.insert(StateOf(entry));
+    bool const hasEnded = ended.count(StateOf(entry)) > 0;
+    if (seen.insert(entry.fId).second) events.push_back({entry, SensorOf(entry, sensors), AgeOf(entry, log.fClock), hasEnded});
+  });
+  std::reverse(events.begin(), events.end());
+  return events;
+}
+
+void WriteLog(TRecordWriter& writer, TController const& controller) {
+  auto const& log = controller.fLog;
+  TRecords logs, entries;
+  if (log) {
+    logs.push_back(LogRecord(*log));
+    for (TLoggedEvent const& event : EventsOf(*log, controller.fSensors)) entries.push_back(EntryRecord(event));
+  }
+  TFinding<bool> const isComplete = log.Then([](TEventLog const& known) { return known.fIsComplete; });
+  writer.Write(LogRecord({}), logs, WhyNone(log, ""));
+  writer.Write(EntryRecord({}), entries, WhyNone(isComplete, "the event log is empty"));
+}
+
+}  // namespace
+
+void FillControllerNamespace(TController const& controller, TMachineFiles const& files, TMemoryNamespace& ns) {
+  TComputerSystem const system(files);
+  TRecordWriter writer(ns);
+  writer.Write(system.Record());
+  TRecord const device = ControllerRecord(controller, system);
+  TRecords devices;
+  if (controller.fDeviceId) devices.push_back(device);
+  writer.Write(device, devices, WhyNone(controller.fDeviceId, ""));
+  if (controller.fDeviceId) writer.Associate(kSystemDevice, system.Record(), device);
+
+  WriteAll(writer, controller.fLans, NetworkRecord, "the controller has no LAN channel");
+  WriteAll(
+      writer, controller.fUsers, [&](TUserAccount const& account) { return AccountRecord(account, system); },
+      "the controller has no accounts");
+  WriteSensors(writer, controller, system);
+  WritePackages(writer, controller);
+  WriteLog(writer, controller);
+  writer.WriteMissing();
+}
+
+}  // namespace NQRVZEP20

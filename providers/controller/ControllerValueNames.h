@@ -1,0 +1,13 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+// The names that the DMTF schema gives to the numbers of enumerated properties.
+
+#include "providers/reasons/SensorValueNames.h"
+
+namespace NQRVZEP20 {
+
+constexpr TValueName kEnabledStateNames[] = {{"0", "Unknown"}, {"2", "Enabled"}, {"3", "Disabled"}};
+constexpr TValueName kPackageTypeNames[] = {{"0", "Unknown"}, {"1", "Other"}, {"3", "Chassis/Frame"}, {"9", "Module/Card"}};
+
+}  // namespace NQRVZEP20

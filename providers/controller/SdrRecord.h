@@ -1,0 +1,63 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "providers/reasons/TFinding.h"
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+
+namespace NQRVZEP20 {
+
+// The conversion of raw readings to the unit of the sensor.
+struct TSensorScale {
+  std::uint8_t fForm = 3;  // of the raw byte: 0 unsigned, 1 and 2 signed; 3: the sensor has no number
+  std::uint8_t fLinearization = 0;
+  std::int16_t fM = 0, fB = 0;
+  std::int8_t fResultExponent = 0, fBExponent = 0;
+
+  bool HasNumber() const { return fForm != 3; }
+  bool IsWhole() const { return fLinearization == 0 && fResultExponent >= 0 && fBExponent + fResultExponent >= 0; }
+};
+
+// Raw thresholds and a bit for each that is valid.
+struct TRawThresholds {
+  enum EPlace { kLowerNonCritical, kLowerCritical, kLowerFatal, kUpperNonCritical, kUpperCritical, kUpperFatal, kCount };
+
+  std::uint8_t fValid = 0;  // bit n: the threshold of EPlace n
+  std::uint8_t fRaw[kCount] = {};
+};
+
+// A sensor of the repository of sensor data records (SDR).
+struct TSdrSensor {
+  enum class EKind { kFull, kCompact, kEventOnly };
+
+  EKind fKind = EKind::kFull;
+  std::uint8_t fOwner = 0x20, fLun = 0, fNumber = 0;  // of the controller that has the sensor
+  std::uint8_t fEntity = 0, fEntityInstance = 0;
+  std::uint8_t fType = 0, fReadingType = 0;
+  bool fIsPercentage = false;
+  std::uint8_t fUnit = 0, fRateUnit = 0;
+  TSensorScale fScale = {};
+  TRawThresholds fThresholds = {};  // as the repository has them
+  TFinding<std::string> fName = TMissing{};
+};
+
+// A FRU device of the repository.
+struct TFruLocator {
+  bool fIsLogical = false;  // only logical devices are read by commands to the controller
+  std::uint8_t fController = 0x20, fLun = 0, fDevice = 0;
+  TFinding<std::string> fName = TMissing{};
+};
+
+// What a record describes; neither of the two for a record of another kind, and for one that is cut short.
+struct TSdrRecord {
+  std::optional<TSdrSensor> fSensor;
+  std::optional<TFruLocator> fFru;
+};
+
+// `record`: all its bytes, with its header.
+TSdrRecord SdrRecordFrom(std::string_view record);
+
+}  // namespace NQRVZEP20

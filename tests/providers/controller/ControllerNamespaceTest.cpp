@@ -1,0 +1,130 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "providers/controller/ControllerNamespace.h"
+
+#include "tests/Support.h"
+#include "tests/providers/NamespaceText.h"
+#include "tests/providers/controller/FakeController.h"
+
+#include <gmock/gmock.h>
+
+namespace NQRVZEP20 {
+namespace {
+
+using testing::HasSubstr;
+using testing::Not;
+
+class ControllerNamespaceTest : public testing::Test {
+protected:
+  ControllerNamespaceTest() {
+    auto& answers = fController.fAnswers;
+    answers[Bytes({6, 1})] = Bytes({0, 0x20, 0x81, 0x01, 0x10, 0x02, 0x9F, 0x91, 0x12, 0, 0x02, 0x0F});
+    answers[Bytes({6, 0x37})] = Bytes({0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16});
+    answers[Bytes({6, 0x42, 1})] = Bytes({0, 1, 4, 1, 0, 0, 0, 0, 0, 0});
+    answers[Bytes({0x0C, 2, 1, 3, 0, 0})] = Bytes({0, 0x11, 192, 0, 2, 7});
+    answers[Bytes({0x0C, 2, 1, 4, 0, 0})] = Bytes({0, 0x11, 1});
+    answers[Bytes({0x0C, 2, 1, 5, 0, 0})] = Bytes({0, 0x11, 2, 0xA, 0xB, 0xC, 0xD, 0xE});
+    answers[Bytes({0x0C, 2, 1, 6, 0, 0})] = Bytes({0, 0x11, 255, 255, 255, 0});
+    answers[Bytes({0x0C, 2, 1, 12, 0, 0})] = Bytes({0, 0x11, 0, 0, 0, 0});
+    answers[Bytes({6, 0x44, 1, 1})] = Bytes({0, 3, 0x82, 0, 0x04});
+    answers[Bytes({6, 0x44, 1, 2})] = Bytes({0, 3, 0x42, 0, 0x14});
+    answers[Bytes({6, 0x44, 1, 3})] = Bytes({0, 3, 0x82, 0, 0x0F});
+    answers[Bytes({6, 0x46, 1})] = Bytes({0}) + std::string(16, '\0');
+    answers[Bytes({6, 0x46, 2})] = Bytes({0}) + "zepadmin" + std::string(8, '\0');
+    answers[Bytes({6, 0x46, 3})] = Bytes({0}) + "guest" + std::string(11, '\0');
+    fController.fRecords = {FullSensorRecord(0, 0x30, "CPU Temp"), CompactSensorRecord(1, 0x51, 8, "PSU 1"),
+                            FullSensorRecord(2, 0x30, "again")};
+    answers[Bytes({4, 0x2D, 0x30})] = Bytes({0, 91, 0xC0, 0x18, 0});
+    answers[Bytes({4, 0x27, 0x30})] = Bytes({0, 0x38, 0, 0, 0, 81, 90, 100});
+    answers[Bytes({4, 0x2D, 0x51})] = Bytes({0, 0, 0xC0, 0x03, 0x80});
+    fController.fEvents = {SelEvent(0, 1, 0x30, 1, 0x59, 91, 90), SelEvent(1, 8, 0x51, 0x6F, 1, 0xFF, 0xFF, 1612137000),
+                           SelEvent(2, 1, 0x30, 0x81, 0x59, 88, 90), SelEvent(3, 8, 0x99, 0x6F, 1, 0xFF, 0xFF, 3600)};
+    fController.fFru = FruDevice() + std::string(1024, '\xFF');
+  }
+
+  std::string Fill() {
+    auto const controller = ReadController(
+        fController.Connection(), [](std::string const&) { return nullptr; }, [](char const*, std::size_t, std::size_t) {});
+    FillControllerNamespace(controller, TMachineFiles(fDir.Path()), *fNs);
+    return TextOf(*fNs);
+  }
+
+  TEnvironmentGuard fNamed{"ZEP_HOST_NAME", "s1"};
+  TTempDir const fDir;
+  TFakeController fController;
+  boost::shared_ptr<TMemoryNamespace> fNs = NewNamespace();
+};
+
+TEST_F(ControllerNamespaceTest, EveryPartHasItsInstances) {
+  std::string const text = Fill();
+  for (char const* const line :
+       {"FirmwareVersion: 1.10",
+        "IPMIVersion: 2.0",
+        "ManufacturerID: 4753",
+        "ProductID: 3842",
+        "GUID: 100f0e0d-0c0b-0a09-0807-060504030201",
+        "IPv4Address: 192.0.2.7",
+        "AddressSource: static",
+        "SubnetMask: 255.255.255.0",
+        "MACAddress: 02:0a:0b:0c:0d:0e",
+        "DefaultGateway: <the controller reports 0.0.0.0: none is set>",
+        "UserID: zepadmin",
+        "UserID: guest",
+        "Privilege: Administrator",
+        "Privilege: No Access",
+        "ElementName: CPU Temp",
+        "CurrentReading: 91",
+        "CurrentState: Upper Critical",
+        "UpperThresholdNonCritical: 81",
+        "LowerThresholdCritical: <the sensor has no such threshold>",
+        "ElementName: PSU 1",
+        "CurrentState: Presence detected, Power Supply Failure detected",
+        "SerialNumber: KQ12345",
+        "Model: Server Q100",
+        "UserTracking: asset 5",
+        "ManufactureDate: 20220101000000.000000+000",
+        "OtherIdentifyingInfo: rail kit",
+        "CurrentNumberOfRecords: 4",
+        "MaxNumberOfRecords: 104",
+        "ClockTime: 20210201000000.000000+000",
+        "RecordData: CPU Temp: Upper Critical - going high, asserted; reading 91, threshold 90 degrees C",
+        "RecordData: PSU 1: Power Supply Failure detected, asserted",
+        "Age: 600",
+        "HasEnded: true",
+        "HasEnded: false"})
+    EXPECT_THAT(text, HasSubstr(std::string("  ") + line + "\n"));
+  EXPECT_THAT(text, HasSubstr("00000000010000.000000:000")) << "before the clock was set, times are intervals";
+  EXPECT_THAT(text, Not(HasSubstr("ElementName: again"))) << "the second record of one sensor";
+}
+
+TEST_F(ControllerNamespaceTest, AControllerThatFallsSilentLeavesReasons) {
+  fController.fMostRequests = 38;  // up to the event log
+  std::string const text = Fill();
+  EXPECT_THAT(text, HasSubstr("FirmwareVersion: 1.10"));
+  EXPECT_THAT(text, HasSubstr("event log: the controller does not answer"));
+  EXPECT_EQ(TReasonReader(*fNs).WhyNoInstance("ZEP_EventLog")->fReason, "the controller does not answer");
+}
+
+TEST_F(ControllerNamespaceTest, NoControllerLeavesTheReasonInEachClass) {
+  fController.fMostRequests = 0;
+  Fill();
+  TReasonReader const reasons(*fNs);
+  for (char const* const name : {"ZEP_ManagementController", "ZEP_ControllerNetwork", "ZEP_ControllerAccount", "CIM_Sensor",
+                                 "CIM_NumericSensor", "CIM_PhysicalPackage", "ZEP_EventLog", "ZEP_EventLogEntry"})
+    EXPECT_EQ(reasons.WhyNoInstance(name)->fReason, "the controller does not answer") << name;
+}
+
+TEST_F(ControllerNamespaceTest, AnswersOfAnyLengthAreHarmless) {
+  auto const whole = fController.Connection();
+  for (std::size_t length = 0; length < 24; ++length) {
+    TIpmi const cut = [&](TIpmiRequest const& request) {
+      return whole(request).Then([&](std::string const& answer) { return answer.substr(0, length); });
+    };
+    auto const ns = NewNamespace();
+    auto const controller = ReadController(
+        cut, [](std::string const&) { return nullptr; }, [](char const*, std::size_t, std::size_t) {});
+    EXPECT_NO_THROW(FillControllerNamespace(controller, TMachineFiles(fDir.Path()), *ns)) << length;
+  }
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

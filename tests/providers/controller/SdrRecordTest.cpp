@@ -1,0 +1,76 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "providers/controller/SdrRecord.h"
+
+#include "providers/controller/EventWords.h"
+#include "tests/providers/controller/ControllerBytes.h"
+
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20 {
+namespace {
+
+TEST(SdrRecordTest, AFullSensorHasScaleAndThresholds) {
+  auto const sensor = SdrRecordFrom(FullSensorRecord(1, 0x30, "CPU Temp")).fSensor;
+  ASSERT_TRUE(sensor);
+  EXPECT_EQ(sensor->fKind, TSdrSensor::EKind::kFull);
+  EXPECT_EQ(sensor->fNumber, 0x30);
+  EXPECT_EQ(sensor->fType, 1);
+  EXPECT_EQ(sensor->fReadingType, 1);
+  EXPECT_EQ(*sensor->fName, "CPU Temp");
+  EXPECT_EQ(UnitName(sensor->fUnit), "degrees C");
+  EXPECT_EQ(*ValueOf(sensor->fScale, 45), 45);
+  EXPECT_EQ(sensor->fThresholds.fValid, 0x38);
+  EXPECT_EQ(sensor->fThresholds.fRaw[TRawThresholds::kUpperNonCritical], 80);
+  EXPECT_EQ(sensor->fThresholds.fRaw[TRawThresholds::kUpperCritical], 90);
+  EXPECT_EQ(sensor->fThresholds.fRaw[TRawThresholds::kUpperFatal], 100);
+}
+
+TEST(SdrRecordTest, NumbersBelowZeroAreRead) {
+  std::string record = FullSensorRecord(1, 1, "V");
+  record[20] = '\x80';  // signed readings
+  record[24] = '\x38';  // M: -200
+  record[25] = '\xC0';
+  record[26] = '\xFB';  // B: -5
+  record[27] = '\xC0';
+  record[29] = '\xD1';  // exponents -3 and 1
+  TSensorScale const scale = SdrRecordFrom(record).fSensor->fScale;
+  EXPECT_EQ(scale.fM, -200);
+  EXPECT_EQ(scale.fB, -5);
+  EXPECT_DOUBLE_EQ(*ValueOf(scale, 0xFF), (-200 * -1 - 5 * 10) / 1000.0);
+  EXPECT_FALSE(scale.IsWhole());
+}
+
+TEST(SdrRecordTest, ACompactSensorHasNoNumber) {
+  auto const sensor = SdrRecordFrom(CompactSensorRecord(2, 0x51, 8, "PSU 1")).fSensor;
+  ASSERT_TRUE(sensor);
+  EXPECT_EQ(sensor->fType, 8);
+  EXPECT_EQ(sensor->fReadingType, 0x6F);
+  EXPECT_EQ(*sensor->fName, "PSU 1");
+  EXPECT_EQ(ValueOf(sensor->fScale, 1).Why().fCode, kMissingNotApplicable);
+}
+
+TEST(SdrRecordTest, AFruDeviceIsLocated) {
+  auto const fru = SdrRecordFrom(FruLocatorRecord(3, 5, "Riser")).fFru;
+  ASSERT_TRUE(fru);
+  EXPECT_TRUE(fru->fIsLogical);
+  EXPECT_EQ(fru->fDevice, 5);
+  EXPECT_EQ(*fru->fName, "Riser");
+}
+
+TEST(SdrRecordTest, ARecordThatIsCutShortDescribesNothing) {
+  std::string const record = FullSensorRecord(1, 0x30, "CPU Temp");
+  for (std::size_t length = 0; length < 48; ++length) {
+    TSdrRecord const cut = SdrRecordFrom(record.substr(0, length));
+    EXPECT_FALSE(cut.fSensor || cut.fFru) << length;
+  }
+  EXPECT_EQ(*SdrRecordFrom(record.substr(0, 50)).fSensor->fName, "CP");
+}
+
+TEST(SdrRecordTest, BytesBeyondTheStatedLengthAreIgnored) {
+  std::string record = FullSensorRecord(1, 0x30, "CPU Temp");
+  record[4] = static_cast<char>(record[4] - 5);
+  EXPECT_EQ(*SdrRecordFrom(record).fSensor->fName, "CPU");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20
