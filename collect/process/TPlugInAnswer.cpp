@@ -73,6 +73,7 @@ void TPlugInAnswer::Take(TMessage const& message) {
       fResult.fLogsDebug = true;
       return;
     case EMessage::kDone:
+      if (fProvider) Fail("its result ended before its namespace was complete");
       fState = EState::kDone;
       return;
   }
