@@ -13,10 +13,10 @@ TFinding<TCIMDateTime> DateTimeFrom(std::uint64_t secondsSince1970, unsigned mic
 
 // When the machine was started, and the time at which its files were read. Both are in UTC, in whole seconds.
 struct TRunningClock {
-  TFinding<std::uint64_t> fBootSeconds;  // since 1970
-  TFinding<TCIMDateTime> fBootTime;
-  TFinding<TCIMDateTime> fTime;
-  TFinding<std::uint64_t> fUptime;  // in seconds
+  TFinding<std::uint64_t> fBootSeconds = TMissing{};  // since 1970
+  TFinding<TCIMDateTime> fBootTime = TMissing{};
+  TFinding<TCIMDateTime> fTime = TMissing{};
+  TFinding<std::uint64_t> fUptime = TMissing{};  // in seconds
 };
 
 TRunningClock RunningClockOf(TMachineFiles const& files);

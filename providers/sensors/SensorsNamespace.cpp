@@ -54,13 +54,14 @@ void WritePowerSupplies(TRecordWriter& writer, TMachineFiles const& files, TComp
 
 void WriteKernelLog(TRecordWriter& writer, TMachineFiles const& files, TRecord const& system) {
   auto const log = ReadKernelLog(files);
-  TRunningClock const clock = RunningClockOf(files);
   TRecords logs, events;
   if (log) logs.push_back(KernelLogRecord(*log));
-  if (log)
+  if (log && !log->fEvents.empty()) {
+    TRunningClock const clock = RunningClockOf(files);  // reading it takes long on a machine with many processors
     for (TKernelEvent const& event : log->fEvents) events.push_back(KernelEventRecord(event, clock));
+  }
   writer.Write(KernelLogRecord({}), logs, log ? TMissing{} : log.Why());
-  writer.Write(KernelEventRecord({}, clock), events,
+  writer.Write(KernelEventRecord({}, {}), events,
                log ? TMissing{kMissingNotGiven, "the log of the kernel reports no error"} : log.Why());
   for (TRecord const& each : logs) writer.Associate(kUseOfLog, each, system);
   for (TRecord const& each : events) writer.Associate(kLogManagesRecord, logs.front(), each);

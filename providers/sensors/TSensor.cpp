@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <limits>
 #include <map>
+#include <set>
 
 namespace NQRVZEP20 {
 
@@ -39,11 +40,12 @@ TFinding<std::int32_t> Scaled(std::int64_t number, TKindOfFile const& kind, std:
   return TMissing{kMissingUnexpected, path + " contains " + std::to_string(number) + ", which no such sensor can measure"};
 }
 
-// The files of one sensor.
+// The files of one sensor. `names`: of all files of the chip, so that missing ones need not be opened.
 class TSensorFiles {
 public:
-  TSensorFiles(TMachineFiles const& files, std::string const& path, TKindOfFile const& kind)
-      : fFiles(files), fPath(path), fKind(kind) {}
+  TSensorFiles(TMachineFiles const& files, std::set<std::string> const& names, std::string const& directory,
+               std::string const& name, TKindOfFile const& kind)
+      : fFiles(files), fNames(names), fDirectory(directory), fName(name), fKind(kind) {}
 
   TFinding<std::int32_t> Reading() const {
     auto const reading = Number("_input");
@@ -53,31 +55,38 @@ public:
   TSensor::TThreshold Threshold(char const* ending) const {
     auto const threshold = Number(ending);
     if (!threshold || (*threshold != 0 && *threshold >= -fKind.fHighest && *threshold <= fKind.fHighest)) return threshold;
-    return TMissing{kMissingPlaceholder, fPath + ending + " contains " + std::to_string(*threshold) + ": no threshold is set"};
+    return TMissing{kMissingPlaceholder, Path(ending) + " contains " + std::to_string(*threshold) + ": no threshold is set"};
   }
 
-  TFinding<std::string> Label() const { return fFiles.Line(fPath + "_label"); }
+  TFinding<std::string> Label() const {
+    return Has("_label") ? fFiles.Line(Path("_label")) : TFinding<std::string>(None("_label"));
+  }
 
   bool IsFaulty() const {
-    auto const fault = fFiles.Number<int>(fPath + "_fault");
+    if (!Has("_fault")) return false;
+    auto const fault = fFiles.Number<int>(Path("_fault"));
     return fault && *fault != 0;
   }
 
 private:
+  std::string Path(char const* ending) const { return fDirectory + fName + ending; }
+  bool Has(char const* ending) const { return fNames.count(fName + ending) != 0; }
+  TMissing None(char const* ending) const { return {kMissingNotGiven, Path(ending) + " does not exist"}; }
+
   TFinding<std::int32_t> Number(char const* ending) const {
-    std::string const path = fPath + ending;
+    if (!Has(ending)) return None(ending);
+    std::string const path = Path(ending);
     return fFiles.Number<std::int64_t>(path).Then([&](std::int64_t number) { return Scaled(number, fKind, path); });
   }
 
   TMachineFiles const& fFiles;
-  std::string const& fPath;
+  std::set<std::string> const& fNames;
+  std::string const &fDirectory, &fName;
   TKindOfFile const& fKind;
 };
 
-TSensor SensorOf(TMachineFiles const& files, std::string const& chip, std::string const& directory, std::string const& name,
+TSensor SensorOf(TSensorFiles const& sensor, std::string const& chip, std::string const& path, std::string const& name,
                  TKindOfFile const& kind) {
-  std::string const path = directory + name;
-  TSensorFiles const sensor(files, path, kind);
   bool const isPower = kind.fKind == EKind::kPower;  // "power1_cap" is the limit that the chip itself keeps
   return {chip,
           name,
@@ -101,9 +110,9 @@ std::string ChipName(TMachineFiles const& files, std::string const& directory, s
 }
 
 // The names of the sensors of a chip, each once: "temp1".
-std::vector<std::string> SensorNames(TMachineFiles const& files, std::string const& directory) {
+std::vector<std::string> SensorNames(std::vector<std::string> const& files) {
   std::vector<std::string> names;
-  for (std::string const& file : files.Names(directory)) {
+  for (std::string const& file : files) {
     std::string const name = file.substr(0, file.find('_'));
     bool const isReading = file == name + "_input" || file == name + "_average";
     if (isReading && std::find(names.begin(), names.end(), name) == names.end()) names.push_back(name);
@@ -120,8 +129,11 @@ std::vector<TSensor> ReadSensors(TMachineFiles const& files) {
     std::string const directory = kClass + entry + "/";
     std::string chip = ChipName(files, directory, entry);
     if (int const number = ++counts[chip]; number > 1) chip += " #" + std::to_string(number);
-    for (std::string const& name : SensorNames(files, directory))
-      if (TKindOfFile const* const kind = KindOf(name)) sensors.push_back(SensorOf(files, chip, directory, name, *kind));
+    auto const fileNames = files.Names(directory);
+    std::set<std::string> const names(fileNames.begin(), fileNames.end());
+    for (std::string const& name : SensorNames(fileNames))
+      if (TKindOfFile const* const kind = KindOf(name))
+        sensors.push_back(SensorOf(TSensorFiles(files, names, directory, name, *kind), chip, directory + name, name, *kind));
   }
   std::stable_sort(sensors.begin(), sensors.end(),
                    [](TSensor const& one, TSensor const& other) { return one.fChip < other.fChip; });
