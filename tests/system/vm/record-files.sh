@@ -39,6 +39,8 @@ done
 for file in os-release resolv.conf hostname fstab; do [ ! -e /etc/$file ] || cp -L /etc/$file $tree/etc/; done
 mkdir -p $tree/run/udev
 [ ! -e /run/udev/data ] || cp -a /run/udev/data $tree/run/udev/
+mkdir $tree/dev
+timeout 2 cat /dev/kmsg > $tree/dev/kmsg  # it ends only with a signal
 ZEP_RECORD_ANSWERS=$tree $zep report --json --plugin-timeout 120 > /out/report.json 2> /out/report.err
 echo "zep report ended with status $?"
 exit 0

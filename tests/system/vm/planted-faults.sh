@@ -1,0 +1,35 @@
+#!/bin/sh
+# SPDX-License-Identifier: Apache-2.0
+#
+# Plants faults in a virtual server: a pulled array member, a full file system, an unplugged cable, a process killed for lack of
+# memory, a disk with errors, a machine check, a sensor beyond its threshold, and a clock that is not synchronised. zep must find
+# each with its remedy, nothing before, and nothing after they are mended.
+#
+#   planted-faults.sh BUILD [DIRECTORY]    exit status: 0 if it does, otherwise 1; 77 if a program is missing, unless CI is "true"
+#
+# BUILD is a build tree with zep and the provider plug-ins. DIRECTORY, if given, receives zep's documents.
+# QEMU cannot narrow the link of a PCI Express device, so that this fault is not among them.
+#
+# Needs: what server-vm.sh needs, and perl.
+set -eu
+[ $# -ge 1 ] || { sed -n '3,15s/^# \{0,1\}//p' "$0" >&2; exit 2; }
+here=$(cd "$(dirname "$0")" && pwd)
+build=$(cd "$1" && pwd) outputs=${2:-}
+for program in perl mdadm dmsetup lvm ip sfdisk mkfs.ext4 udevadm swtpm python3 qemu-system-x86_64; do
+  PATH=$PATH:/usr/sbin command -v "$program" >/dev/null && continue
+  echo "planted-faults.sh: $program is missing" >&2
+  [ "${CI:-}" = true ] && exit 1
+  exit 77
+done
+"$here/fetch-kernel.sh" full >/dev/null
+kernel=${ZEP_TESTBED_CACHE:-${TMPDIR:-/tmp}/zep-testbeds}/kernel-full
+stub=$(find "$kernel/lib/modules" -name i2c-stub.ko)
+work=$(mktemp -d "${TMPDIR:-/tmp}/zep-faults.XXXXXX")
+trap 'rm -rf "$work"' EXIT
+status=0
+"$here/server-vm.sh" server "sh $here/plant-faults.sh $build/bin/zep $stub" --module lm75 --file "$stub" \
+  --file "$here/plant-faults.sh" --file "$(command -v perl)" --file "$build/bin/zep" --file "$build/lib" --out "$work" \
+  > "$work/output" 2>&1 || status=$?
+[ -z "$outputs" ] || { mkdir -p "$outputs"; cp -r "$work/." "$outputs/"; }
+[ $status = 0 ] || { cat "$work/output" >&2; exit 1; }
+python3 -B "$here/planted-faults.py" "$work"
