@@ -265,6 +265,16 @@ TEST_F(ProvidersTest, TheNameOfAProviderIsReadWhenItIsRegistered) {
   }
 }
 
+TEST_F(ProvidersTest, ANameThatAPlugInRegistersTwiceIsNamed) {
+  Add({"RegistersTwice"});
+  TRun const run = Run({"report", "--json"});
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_THAT(JsonOf(run)["reason"].get<std::string>(),
+              HasSubstr("RegistersTwice: the plug-in registers this name twice; the second registration is ignored "
+                        "(registration, libRegistersTwice.nsp.so)"));
+  EXPECT_EQ(Run({"show", "X_RegistersTwice"}).fOutput.rfind("root/RegistersTwice:X_RegistersTwice\n", 0), 0u);
+}
+
 TEST_F(ProvidersTest, OfTwoPlugInsWithOneNameBothAreNamed) {
   Add({"TwinA", "TwinB"});
   TRun const run = Run({"report", "--json"});
