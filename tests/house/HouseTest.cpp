@@ -128,6 +128,7 @@ TTestWithoutSource const kTestsWithoutSource[] = {
     {"proxy/DhcpParserTest.cpp", "the part of AutoProxyDiscovery that needs no network"},
     {"tools/zep/commands/ArgumentsTest.cpp", "every command of zep: its arguments"},
     {"tools/zep/commands/EnvelopeTest.cpp", "every command of zep: its exit status and document"},
+    {"tools/zep/commands/ProvidersAtWorkTest.cpp", "commands/Providers: limits, interrupts and progress of plug-ins"},
 };
 
 char const* ReasonForNoSource(fs::path const& test) {
