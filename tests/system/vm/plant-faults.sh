@@ -1,8 +1,8 @@
 #!/bin/sh
 # SPDX-License-Identifier: Apache-2.0
 #
-# Lets zep look for problems in this virtual server: healthy, with faults, and mended. Runs inside the virtual machine of
-# planted-faults.sh.
+# Lets zep look for problems in this virtual machine: healthy, with faults, and mended. Runs inside the machine of
+# planted-faults.sh. Its third serial port is QEMU's monitor (QMP), by which it unplugs a cable.
 #
 #   plant-faults.sh ZEP I2C_STUB      I2C_STUB: the kernel module of that name
 #
@@ -23,6 +23,18 @@ sensor_limit() {
   for chip in /sys/class/hwmon/*; do [ "$(cat "$chip/name")" != lm75 ] || echo "$1" > "$chip/temp1_max"; done
 }
 
+hostname faults
+# A mirror of two disks with a file system, and a bond of two ports.
+mdadm --create /dev/md0 --run --level=1 --raid-devices=2 --metadata=1.2 --assume-clean /dev/vda /dev/vdb
+mkfs.ext4 -q /dev/md0
+mkdir -p /data
+mount /dev/md0 /data
+ip link del bond0  # the module makes one of another mode
+ip link add bond0 type bond mode active-backup miimon 100
+for port in eth0 eth1; do ip link set "$port" master bond0; done
+ip link set bond0 up
+ip addr add 192.0.2.10/24 dev bond0
+
 stty -F /dev/ttyS2 115200 raw -echo
 exec 9<> /dev/ttyS2
 qmp '{"execute":"qmp_capabilities"}'
@@ -41,10 +53,9 @@ synchronise_clock
 dmesg -c > /out/start.txt
 ask healthy
 
-member=$(sed -n 's/^md0 .*raid1 \([a-z0-9]*\)\[.*/\1/p' /proc/mdstat)
-mdadm /dev/md0 --fail "/dev/$member" --remove "/dev/$member"
+mdadm /dev/md0 --fail /dev/vdb --remove /dev/vdb
 dd if=/dev/zero of=/data/full bs=1M 2> /out/dd.txt || :
-monitor 'set_link n1 off'
+monitor 'set_link n0 off'
 sh -c 'echo $$ > /run/groups/small/cgroup.procs; exec tail /dev/zero' || :
 echo '0 2048 error' | dmsetup create --noudevsync broken
 dmsetup mknodes
@@ -57,8 +68,8 @@ ask faults
 
 rm /data/full
 sync
-mdadm /dev/md0 --add "/dev/$member"
-monitor 'set_link n1 on'
+mdadm /dev/md0 --add /dev/vdb
+monitor 'set_link n0 on'
 dmsetup remove --noudevsync broken
 sensor_limit 80000
 hwclock -s

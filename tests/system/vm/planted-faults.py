@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-"""Checks zep's findings in a virtual server that was healthy, had faults, and was mended (planted-faults.sh).
+"""Checks zep's findings in a virtual machine that was healthy, had faults, and was mended (planted-faults.sh).
 
 planted-faults.py DIRECTORY    DIRECTORY has healthy.json, faults.json and mended.json
 """
@@ -20,8 +20,16 @@ FAULTS = [
 ]
 
 
-def problems(directory, name):
-    return json.loads((directory / f"{name}.json").read_text())["findings"]["problems"]
+def findings(directory, name):
+    return json.loads((directory / f"{name}.json").read_text())["findings"]
+
+
+def without_fault(directory, name):
+    """The problems of a machine that has none, and the rules about the faults that could not be asked."""
+    document = findings(directory, name)
+    outcomes = {rule["id"]: rule["outcome"] for rule in document["rules"]}
+    return [f"{name}: {describe(each)}" for each in document["problems"]] + [
+        f"{name}: {rule} is {outcomes[rule]}" for rule, *_ in FAULTS if outcomes[rule] != "fine"]
 
 
 def describe(problem):
@@ -30,8 +38,8 @@ def describe(problem):
 
 def main():
     directory = pathlib.Path(sys.argv[1])
-    failures = [f"{name}: {describe(each)}" for name in ("healthy", "mended") for each in problems(directory, name)]
-    found = problems(directory, "faults")
+    failures = without_fault(directory, "healthy") + without_fault(directory, "mended")
+    found = findings(directory, "faults")["problems"]
     for rule, severity, reason, remedy in FAULTS:
         matches = [each for each in found if (each["rule"], each["severity"]) == (rule, severity)]
         if not any(reason in each["reason"] and remedy in each["remedy"] for each in matches):

@@ -1,7 +1,7 @@
 #!/bin/sh
 # SPDX-License-Identifier: Apache-2.0
 #
-# Plants faults in a virtual server: a pulled array member, a full file system, an unplugged cable, a process killed for lack of
+# Plants faults in a virtual machine: a pulled array member, a full file system, an unplugged cable, a process killed for lack of
 # memory, a disk with errors, a machine check, a sensor beyond its threshold, and a clock that is not synchronised. zep must find
 # each with its remedy, nothing before, and nothing after they are mended.
 #
@@ -10,12 +10,12 @@
 # BUILD is a build tree with zep and the provider plug-ins. DIRECTORY, if given, receives zep's documents.
 # QEMU cannot narrow the link of a PCI Express device, so that this fault is not among them.
 #
-# Needs: what server-vm.sh needs, and perl.
+# Needs: what run-in-vm.sh needs, and the packages mdadm, dmsetup, iproute2, e2fsprogs, perl, python3.
 set -eu
 [ $# -ge 1 ] || { sed -n '3,15s/^# \{0,1\}//p' "$0" >&2; exit 2; }
 here=$(cd "$(dirname "$0")" && pwd)
 build=$(cd "$1" && pwd) outputs=${2:-}
-for program in perl mdadm dmsetup lvm ip sfdisk mkfs.ext4 udevadm swtpm python3 qemu-system-x86_64; do
+for program in perl mdadm dmsetup ip mkfs.ext4 python3 qemu-system-x86_64; do
   PATH=$PATH:/usr/sbin command -v "$program" >/dev/null && continue
   echo "planted-faults.sh: $program is missing" >&2
   [ "${CI:-}" = true ] && exit 1
@@ -26,10 +26,24 @@ kernel=${ZEP_TESTBED_CACHE:-${TMPDIR:-/tmp}/zep-testbeds}/kernel-full
 stub=$(find "$kernel/lib/modules" -name i2c-stub.ko)
 work=$(mktemp -d "${TMPDIR:-/tmp}/zep-faults.XXXXXX")
 trap 'rm -rf "$work"' EXIT
+
+devices="-M q35"
+for number in 0 1; do
+  truncate -s 64M "$work/disk$number"
+  devices="$devices -drive file=$work/disk$number,if=none,id=d$number,format=raw -device virtio-blk-pci,drive=d$number"
+  devices="$devices -netdev user,id=n$number,restrict=on -device virtio-net-pci,netdev=n$number"
+done
+monitor="-chardev socket,id=monitor,path=$work/monitor,server=on,wait=off -mon chardev=monitor,mode=control"
+monitor="$monitor -chardev socket,id=serial,path=$work/monitor -serial chardev:serial"
+set --
+for module in virtio_pci virtio_blk virtio_net md-mod raid1 dm-mod ext4 bonding lm75; do set -- "$@" --module "$module"; done
+for program in perl mdadm dmsetup ip mkfs.ext4; do
+  set -- "$@" --file "$(PATH=$PATH:/usr/sbin command -v "$program")"
+done
 status=0
-"$here/server-vm.sh" server "sh $here/plant-faults.sh $build/bin/zep $stub" --module lm75 --file "$stub" \
-  --file "$here/plant-faults.sh" --file "$(command -v perl)" --file "$build/bin/zep" --file "$build/lib" --out "$work" \
+"$here/run-in-vm.sh" "$@" --file "$stub" --file "$here/plant-faults.sh" --file "$build/bin/zep" --file "$build/lib" --file /etc/os-release \
+  --out "$work/out" --timeout 400 --qemu "$devices $monitor" sh "$here/plant-faults.sh" "$build/bin/zep" "$stub" \
   > "$work/output" 2>&1 || status=$?
-[ -z "$outputs" ] || { mkdir -p "$outputs"; cp -r "$work/." "$outputs/"; }
+[ -z "$outputs" ] || { mkdir -p "$outputs"; cp -r "$work/output" "$work/out/." "$outputs/"; }
 [ $status = 0 ] || { cat "$work/output" >&2; exit 1; }
-python3 -B "$here/planted-faults.py" "$work"
+python3 -B "$here/planted-faults.py" "$work/out"

@@ -9,8 +9,7 @@
 #
 # The virtual machine has two sockets with two cores each, two NUMA nodes, eight memory modules, a PCI Express switch with an NVMe
 # disk, a SATA, a SCSI, a virtio, a USB and an SD disk, a CD-ROM drive, ports of two drivers, a TPM, and an IPMI KCS interface. Its
-# firmware describes the boards, processors, caches, modules and slots that server-smbios.py lists. Its third serial port,
-# /dev/ttyS2, is QEMU's monitor (QMP), by which a command can unplug a cable.
+# firmware describes the boards, processors, caches, modules and slots that server-smbios.py lists.
 #
 # Needs: what run-in-vm.sh needs, and the packages udev, mdadm, lvm2, iproute2, fdisk, e2fsprogs, smartmontools, pci.ids, swtpm,
 # python3.
@@ -47,9 +46,6 @@ ports="-netdev user,id=n0,restrict=on -device e1000e,netdev=n0,bus=down1,mac=52:
 ports="$ports -netdev user,id=n1,restrict=on -device virtio-net-pci,netdev=n1,mac=52:54:00:11:22:02"
 tpm_device="-chardev socket,id=tpm,path=$work/tpm/socket -tpmdev emulator,id=tpm0,chardev=tpm -device tpm-tis,tpmdev=tpm0"
 
-monitor="-chardev socket,id=monitor,path=$work/monitor,server=on,wait=off -mon chardev=monitor,mode=control"
-monitor="$monitor -chardev socket,id=serial,path=$work/monitor -serial chardev:serial"
-
 kernel=${ZEP_TESTBED_CACHE:-${TMPDIR:-/tmp}/zep-testbeds}/kernel-full
 for module in nvme virtio_pci virtio_blk virtio_net e1000e ahci sdhci-pci mmc_block md-mod raid1 dm-mod bonding veth 8021q bridge \
   tpm_tis ipmi_si pcieport acpiphp; do
@@ -60,5 +56,5 @@ for program in mdadm lvm ip sfdisk mkfs.ext4 mkfs.vfat smartctl udevadm dmsetup 
   set -- "$@" --file "$(command -v "$program" || echo "/usr/sbin/$program")"
 done
 "$here/run-in-vm.sh" --hw --timeout 600 "$@" --file "$here/machines" \
-  --file /lib/systemd/systemd --file /lib/systemd/systemd-udevd --file /lib/udev --file /etc/os-release --file /usr/share/misc/pci.ids --qemu "$cpus $firmware $switch $disks $ports $tpm_device $monitor" \
+  --file /lib/systemd/systemd --file /lib/systemd/systemd-udevd --file /lib/udev --file /etc/os-release --file /usr/share/misc/pci.ids --qemu "$cpus $firmware $switch $disks $ports $tpm_device" \
   sh -c "sh $here/machines/$machine.sh && $command"
