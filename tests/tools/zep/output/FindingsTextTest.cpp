@@ -3,6 +3,7 @@
 // The findings of zep report, run as users run it, on recorded machines.
 
 #include "tests/Machines.h"
+#include "tests/SmbiosTables.h"
 #include "tests/tools/zep/Zep.h"
 
 #include <gmock/gmock.h>
@@ -70,6 +71,31 @@ TEST_F(FindingsTextTest, AHealthyMachineHasNone) {
   nlohmann::json const document = JsonOf(Report("server", {"--json"}));
   EXPECT_THAT(ProblemsOf(document), IsEmpty());
   EXPECT_TRUE(document["findings"]["worst"].is_null());
+}
+
+TEST_F(FindingsTextTest, TablesOfManyFirmwaresGiveNone) {
+  for (std::string const& table : kRealTables) {
+    TTempDir const root;
+    fs::create_directories(root.Path("sys/firmware/dmi"));
+    fs::copy(TestDataPath("smbios/" + table), root.Path("sys/firmware/dmi/tables"));
+    nlohmann::json const document = JsonOf(fInstalled->Run({{"report", "--json"}, {{"ZEP_ROOT", root.Path()}}}));
+    EXPECT_THAT(ProblemsOf(document), IsEmpty()) << table;
+    EXPECT_FALSE(document["instances"].empty()) << table;
+  }
+}
+
+TEST_F(FindingsTextTest, AProcessKilledForLackOfMemoryIsFound) {
+  TTempDir const root;
+  fs::create_directories(root.Path("dev"));
+  fs::create_directories(root.Path("proc"));
+  fs::copy(TestDataPath("kmsg/memory-and-disk"), root.Path("dev/kmsg"));
+  WriteFile(root.Path("proc/uptime"), "7230.00 1.0\n");
+  nlohmann::json const document = JsonOf(fInstalled->Run({{"report", "--json"}, {{"ZEP_ROOT", root.Path()}}}));
+  EXPECT_THAT(ProblemsOf(document),
+              ElementsAre("error out-of-memory", "error disk-errors", "error disk-errors", "warning out-of-memory"));
+  nlohmann::json const& killed = document["findings"]["problems"][0];
+  EXPECT_EQ(killed["reason"], "the kernel killed the process tail because no memory was left, 2 hours ago");
+  EXPECT_EQ(killed["source"], "/dev/kmsg");
 }
 
 TEST_F(FindingsTextTest, BondsWithOneMemberAreFound) {
