@@ -39,11 +39,17 @@ std::string SubjectOf(TElement const& record) {
   return subject.IsKnown() ? *subject.fValue : "";
 }
 
+void NoteGoneRecords(TRuleRun& run, TElement const& log) {
+  auto const gone = log.Number("GoneRecords");
+  if (run.Know(log, gone) && *gone.fValue > 0)
+    run.NoteNotAsked({"older records of the log are gone: " + std::to_string(*gone.fValue), log.Path()});
+}
+
 // The records of these kinds that are young enough. Without the log, notes why the rule could not be asked.
 TRepeatedByKey RecordsOf(TRuleRun& run, std::initializer_list<EKind> kinds) {
   constexpr std::uint64_t secondsOfADay = 86400;
   TRepeatedByKey problems;
-  for (TElement const& log : run.TryElements("ZEP_KernelLog")) run.Know(log, log.Number("GoneRecords"));
+  for (TElement const& log : run.TryElements("ZEP_KernelLog")) NoteGoneRecords(run, log);
   for (TElement const& record : run.Elements("ZEP_KernelLogRecord")) {
     auto const kind = record.Number("Kind"), severity = record.Number("PerceivedSeverity"), age = record.Number("Age");
     if (!run.Know(record, kind) || !run.Know(record, severity) || !run.Know(record, age)) continue;

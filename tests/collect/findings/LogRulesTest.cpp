@@ -77,6 +77,11 @@ TEST(LogRulesTest, AProblemNamesTheNewestRecordAndARemedy) {
 TEST(LogRulesTest, ALogWithoutErrorsIsFine) {
   std::string const log = "instance of ZEP_KernelLog { InstanceID = \"ZEP:log:kernel\"; GoneRecords = 0; };";
   for (char const* rule : {"out-of-memory", "hardware-errors", "disk-errors"}) EXPECT_EQ(Outcome(rule, log), "fine");
+  TRuleResult const result =
+      ResultOf("disk-errors", FindingsOf("instance of ZEP_KernelLog { InstanceID = \"ZEP:log:kernel\"; GoneRecords = 9; };"));
+  EXPECT_EQ(NameOf(result.fOutcome), "fine");
+  ASSERT_THAT(result.fNotAsked, testing::SizeIs(1));
+  EXPECT_EQ(result.fNotAsked.front().fReason, "older records of the log are gone: 9");
   EXPECT_EQ(Outcome("disk-errors", Record(1, kOutOfMemory, kMajor, "tail", 10)), "fine");
 }
 

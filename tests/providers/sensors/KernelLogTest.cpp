@@ -89,6 +89,14 @@ TEST(KernelLogTest, ARecordedMachineHasAFile) {
   EXPECT_THAT(ReadKernelLog(files)->fEvents, SizeIs(1));
 }
 
+TEST(KernelLogTest, AFileThatCannotBeReadHasAReason) {
+  TTempDir const dir;
+  std::filesystem::create_directories(dir.Path("dev/kmsg"));
+  auto const log = ReadKernelLog(TMachineFiles(dir.Path()));
+  ASSERT_FALSE(log);
+  EXPECT_EQ(log.Why().fReason, "/dev/kmsg is not a regular file");
+}
+
 TEST(KernelLogTest, TheLogOfThisMachineIsReadWithoutWaiting) {
   auto const log = ReadKernelLog(TMachineFiles("/"));
   if (log)

@@ -50,8 +50,8 @@ echo +memory > /run/groups/cgroup.subtree_control
 mkdir /run/groups/small
 echo 8M > /run/groups/small/memory.max
 synchronise_clock
-dmesg -c > /out/start.txt
 ask healthy
+dmesg -c > /out/start.txt
 
 mdadm /dev/md0 --fail /dev/vdb --remove /dev/vdb
 dd if=/dev/zero of=/data/full bs=1M 2> /out/dd.txt || :
