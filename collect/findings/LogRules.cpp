@@ -137,17 +137,38 @@ void AskHardware(TRuleRun& run) {
   }
 }
 
+// Whether a SCSI, SATA or USB disk has vanished since the error: someone may have pulled out a USB stick.
+bool WasRemoved(TRuleRun const& run, std::string const& disk) {
+  if (disk.compare(0, 2, "sd") != 0) return false;
+  auto const drives = run.TryElements("CIM_MediaAccessDevice");
+  return !drives.empty() && std::none_of(drives.begin(), drives.end(), [&](TElement const& drive) {
+    auto const name = drive.Text("DeviceID");
+    return name.IsKnown() && *name.fValue == disk;
+  });
+}
+
+void AddDiskProblem(TRuleRun& run, std::string const& disk, std::uint64_t severity, TRepeated const& problem) {
+  bool const wasRemoved = WasRemoved(run, disk);
+  AddProblem(run, problem, severity == kMinor || wasRemoved ? ESeverity::kWarning : ESeverity::kError,
+             "the kernel reports an input or output error of the disk " + disk +
+                 (wasRemoved ? ", which has vanished since" : "") + Often(problem) + MessageOf(problem),
+             wasRemoved ? "Check its cable and power, unless it was removed on purpose."
+                        : "Save the data; check cable and power of the disk, and its health (smartctl -x), and replace it.");
+}
+
+void AddFileSystemProblem(TRuleRun& run, std::string const& device, TRepeated const& problem) {
+  AddProblem(run, problem, ESeverity::kError,
+             "the kernel reports an error of the file system on " + device + Often(problem) + MessageOf(problem),
+             "Save the data, look for errors of the disk, and check the file system while it is not mounted (fsck).");
+}
+
 void AskDisks(TRuleRun& run) {
   for (auto const& [key, problem] : RecordsOf(run, {kDisk, kFileSystem})) {
     auto const& [kind, severity, subject] = key;
     if (kind == kFileSystem)
-      AddProblem(run, problem, ESeverity::kError,
-                 "the kernel reports an error of the file system on " + subject + Often(problem) + MessageOf(problem),
-                 "Save the data, look for errors of the disk, and check the file system while it is not mounted (fsck).");
+      AddFileSystemProblem(run, subject, problem);
     else
-      AddProblem(run, problem, severity == kMinor ? ESeverity::kWarning : ESeverity::kError,
-                 "the kernel reports an input or output error of the disk " + subject + Often(problem) + MessageOf(problem),
-                 "Save the data; check cable and power of the disk, and its health (smartctl -x), and replace it.");
+      AddDiskProblem(run, subject, severity, problem);
   }
 }
 

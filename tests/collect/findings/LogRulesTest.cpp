@@ -58,6 +58,14 @@ TEST(LogRulesTest, ErrorsOfDisksAndFileSystemsAreNamed) {
   EXPECT_THAT(Problems(rule, Record(1, kProcessor, kCritical, "CPU 0", 10)), IsEmpty());
 }
 
+TEST(LogRulesTest, ADiskThatHasVanishedSinceIsAWarning) {
+  std::string const disks = "instance of CIM_DiskDrive { DeviceID = \"sda\"; };";
+  EXPECT_THAT(Problems("disk-errors", disks + Record(1, kDisk, kMajor, "sda", 60) + Record(2, kDisk, kMajor, "sdb", 60)),
+              ElementsAre("error: the kernel reports an input or output error of the disk sda, 1 minute ago (text 1)",
+                          "warning: the kernel reports an input or output error of the disk sdb, which has vanished since, "
+                          "1 minute ago (text 2)"));
+}
+
 TEST(LogRulesTest, OldRecordsAreNotJudged) {
   std::string const old = Record(1, kOutOfMemory, kMajor, "tail", 7 * kDay + 1);
   EXPECT_THAT(Problems("out-of-memory", old), IsEmpty());
