@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "LinkState.h"
 
+#include "providers/reasons/OperationalStatusNames.h"
+
 #include <linux/if.h>
 
 #include <iterator>
@@ -10,13 +12,6 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr TValueName kEnabledStates[] = {{"2", "Enabled"}, {"3", "Disabled"}, {"6", "Enabled but Offline"}, {"7", "In Test"}};
-constexpr TValueName kOperationalStatuses[] = {{"0", "Unknown"},
-                                               {"2", "OK"},
-                                               {"6", "Error"},
-                                               {"10", "Stopped"},
-                                               {"12", "No Contact"},
-                                               {"15", "Dormant"},
-                                               {"16", "Supporting Entity in Error"}};
 
 constexpr std::uint16_t kEnabled = 2, kDisabled = 3, kOffline = 6, kInTest = 7;
 constexpr std::uint16_t kUnknown = 0, kOk = 2, kStopped = 10, kNoContact = 12, kDormant = 15, kLowerInError = 16;
@@ -83,7 +78,7 @@ void AddState(TRecord& record, TLink const& link) {
   auto const status = StatusOf(link);
   record.Add("EnabledState", EnabledStateOf(link)).Names(kEnabledStates);
   record.Add("OperationalStatus", status.Then([](TOperState const& of) { return std::vector<std::uint16_t>{of.fStatus}; }))
-      .Names(kOperationalStatuses);
+      .Names(kOperationalStatusNames);
   record.Add("StatusDescriptions", status.Then([](TOperState const& of) { return std::vector<std::string>{of.fDescription}; }));
 }
 

@@ -3,7 +3,7 @@
 
 // The names that the DMTF schema gives to the numbers of enumerated properties of sensors and logs.
 
-#include "TRecord.h"
+#include "OperationalStatusNames.h"
 
 namespace NQRVZEP20 {
 
@@ -49,28 +49,6 @@ constexpr TValueName kBaseUnitsNames[] = {{"0", "Unknown"},       {"1", "Other"}
                                           {"60", "Bits"},         {"61", "Bytes"},       {"62", "Words (data)"},
                                           {"63", "DoubleWords"},  {"64", "QuadWords"},   {"65", "Percentage"},
                                           {"66", "Pascals"}};
-constexpr TValueName kOperationalStatusNames[] = {{"0", "Unknown"},
-                                                  {"1", "Other"},
-                                                  {"2", "OK"},
-                                                  {"3", "Degraded"},
-                                                  {"4", "Stressed"},
-                                                  {"5", "Predictive Failure"},
-                                                  {"6", "Error"},
-                                                  {"7", "Non-Recoverable Error"},
-                                                  {"8", "Starting"},
-                                                  {"9", "Stopping"},
-                                                  {"10", "Stopped"},
-                                                  {"11", "In Service"},
-                                                  {"12", "No Contact"},
-                                                  {"13", "Lost Communication"},
-                                                  {"14", "Aborted"},
-                                                  {"15", "Dormant"},
-                                                  {"16", "Supporting Entity in Error"},
-                                                  {"17", "Completed"},
-                                                  {"18", "Power Mode"},
-                                                  {"19", "Relocating"},
-                                                  {"..", "DMTF Reserved"},
-                                                  {"0x8000..", "Vendor Reserved"}};
 constexpr TValueName kOverwritePolicyNames[] = {{"0", "Unknown"},  {"2", "Wraps When Full"}, {"7", "Never Overwrites"},
                                                 {"8", "Archives"}, {"..", "DMTF Reserved"},  {"32768..65535", "Vendor Reserved"}};
 constexpr TValueName kLogStateNames[] = {{"0", "Unknown"},        {"2", "Normal"},         {"3", "Erasing"},

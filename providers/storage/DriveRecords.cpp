@@ -2,6 +2,7 @@
 #include "DriveRecords.h"
 
 #include "ValueNames.h"
+#include "providers/reasons/OperationalStatusNames.h"
 #include "providers/reasons/TIdentifiers.h"
 
 #include <algorithm>

@@ -3,6 +3,7 @@
 
 #include "ExtentRecords.h"
 #include "ValueNames.h"
+#include "providers/reasons/OperationalStatusNames.h"
 
 namespace NQRVZEP20 {
 
