@@ -15,7 +15,7 @@ from collections import Counter
 from pathlib import Path
 
 from compare.devices import facts_of_lsblk, facts_of_lshw, facts_of_lspci
-from compare.disks import facts_of_smartctl
+from compare.disks import facts_of_smartctl, missing_while_suspended
 from compare.firmware import facts_of_dmidecode, facts_of_lshw_firmware
 from compare.ports import facts_of_ethtool, facts_of_ip
 from compare.processors import facts_of_lscpu
@@ -70,6 +70,7 @@ def main():
             count[result] += 1
             if result == "missing":
                 missing.append(f"{tool}: {fact} of {names[0]} is {value!r}")
+    missing += missing_while_suspended(outputs.json("zep.json"), outputs.json("zep-suspended.json"))
     print(f"zep: {zep.count} facts")
     for tool, count in counts.items():
         print(f"{tool}: {sum(count.values())} facts, " + ", ".join(f"{number} {name}" for name, number in count.items()))

@@ -24,3 +24,15 @@ def facts_of_smartctl(disk, document):
     for attribute in table:
         for fact, value in leaves(attribute):
             yield [f"ZEP:smart:{disk}:{attribute['id']}"], f"attribute.{fact}", value
+
+
+def missing_while_suspended(before, after):
+    """The instances of storage that zep omits while a disk does not answer, and the state of that disk if it is omitted."""
+    described = {instance["path"] for instance in after["instances"]}
+    for instance in before["instances"]:
+        if instance["provider"] == "Storage" and instance["path"] not in described:
+            yield f"zep: {instance['path']} is missing while a disk does not answer"
+    states = [instance["properties"]["StatusDescriptions"]["value"] for instance in after["instances"]
+              if instance["class"] == "CIM_StorageVolume"]
+    if ["suspended"] not in states:
+        yield "zep: the disk that does not answer is not described as suspended"
