@@ -89,7 +89,8 @@ std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::stri
 // Returns the document about the medium.
 TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
   std::string const name = ReportFileName(report, arguments.fAsJson ? ".json" : ".txt");
-  std::string const text = arguments.fAsJson ? AsVerbatimText(ReportAsJson(report)) : ReportAsText(report, arguments.fParts);
+  std::string const text =
+      arguments.fAsJson ? TReportDocument(report, EMessages::kVerbatim).Text() : ReportAsText(report, arguments.fParts);
   TMountedMedium const medium(arguments.fMedium);
   std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);
   ThrowIfInterrupted(name + " was written to " + medium.Device() + ", which " + RemovalText(stillMountedAt));
@@ -105,10 +106,11 @@ TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
 }
 
 // Returns the document of the report, or of the medium to which it was written. Without --json the report is printed here.
-TJson PrintOrWrite(TReport const& report, TArguments const& arguments) {
-  if (!arguments.fMedium.empty()) return WriteToMedium(report, arguments);
-  if (!arguments.fAsJson) WriteOutput(ReportAsText(report, arguments.fParts));
-  return arguments.fAsJson ? ReportAsJson(report) : TJson();
+TReportDocument PrintOrWrite(TReport const& report, TArguments const& arguments) {
+  if (!arguments.fMedium.empty()) return TReportDocument(WriteToMedium(report, arguments));
+  if (arguments.fAsJson) return TReportDocument(report, EMessages::kWithoutSecrets);
+  WriteOutput(ReportAsText(report, arguments.fParts));
+  return TReportDocument(TJson());
 }
 
 // Adds the result of sending. A report that was not sent makes the command fail.
@@ -131,19 +133,19 @@ void AddSending(TJson& document, TSentReport const& sent) {
 int Deliver(TReport const& report, TTarget const& target, TArguments const& arguments, std::optional<TInterruptGuard>& guard) {
   EExitStatus status = ExitStatusOf(report.fCompleteness);
   if (!arguments.fMedium.empty()) guard.emplace();
-  TJson document = PrintOrWrite(report, arguments);
+  TReportDocument document = PrintOrWrite(report, arguments);
   if (!arguments.fTarget.empty()) {
     if (!guard) guard.emplace();
     TSentReport const sent = SendReport(report, target, arguments.fOptions);
     if (sent.fTransferred.fOutcome.fExit != kExitComplete) status = sent.fTransferred.fOutcome.fExit;
-    AddSending(document, sent);
+    AddSending(document.Members(), sent);
   }
   if (FailsBecauseOfFindings(report, arguments) && (status == kExitComplete || status == kExitPartial)) {
     status = kExitFindings;
-    document["exitStatus"] = static_cast<int>(status);
-    document["reason"] = CountsOf(report.fFindings);
+    document.Members()["exitStatus"] = static_cast<int>(status);
+    document.Members()["reason"] = CountsOf(report.fFindings);
   }
-  if (arguments.fAsJson) WriteOutput(AsText(std::move(document)));
+  if (arguments.fAsJson) WriteOutput(document.Text());
   return status;
 }
 

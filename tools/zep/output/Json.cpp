@@ -15,6 +15,15 @@ namespace {
 
 using TType = TCIMValue::TCIMType;
 
+constexpr std::size_t kUsualProperties = 32;
+
+// An object with room for that many members: when it grows, the library copies those that it has, with everything below them.
+TJson ObjectFor(std::size_t members) {
+  TJson json = TJson::object();
+  json.get_ref<TJson::object_t&>().reserve(members);
+  return json;
+}
+
 TJson RealAsJson(double real, std::string const& text) { return std::isfinite(real) ? TJson(real) : TJson(text); }
 
 TJson ArrayAsJson(std::vector<TCIMValue> const& elements) {
@@ -108,12 +117,12 @@ std::string NameOf(TCIMValue::TCIMType type) {
 TInstanceJson::TInstanceJson(TNamespaceView const& view) : fView(view) {}
 
 TJson TInstanceJson::Of(ICIMInstance const& instance) {
-  TJson json = TJson::object();
+  TJson json = ObjectFor(5);
   json["path"] = fView.PathOf(instance);
   json["provider"] = fView.GetProviderName();
   json["namespace"] = fView.GetName();
   json["class"] = instance.GetClass(TCIMContext())->GetName(TCIMContext());
-  TJson& properties = json["properties"] = TJson::object();
+  TJson& properties = json["properties"] = ObjectFor(kUsualProperties);
   instance.EnumerateProperties(
       [&](boost::shared_ptr<ICIMProperty> property) {
         properties[property->GetName(TCIMContext())] = PropertyAsJson(instance, *property);
@@ -126,7 +135,7 @@ TJson TInstanceJson::Of(ICIMInstance const& instance) {
 TJson TInstanceJson::PropertyAsJson(ICIMInstance const& instance, ICIMProperty const& property) {
   TCIMValue const value = property.GetValue(TCIMContext());
   TDeclared const& declared = DeclaredBy(property.GetDeclaration(TCIMContext()));
-  TJson json = TJson::object();
+  TJson json = ObjectFor(6);
   json["type"] = NameOf(value.GetType());
   json["value"] = ValueAsJson(value);
   TJson words = WordsAsJson(declared.fWords, value);

@@ -7,6 +7,9 @@
 #include "tools/zep/output/PlugInRows.h"
 #include "tools/zep/output/ReportPhrases.h"
 
+#include <cstring>
+#include <string_view>
+
 namespace NQRVZEP20::zep {
 
 namespace {
@@ -30,35 +33,58 @@ TJson PlugInsAsJson(std::vector<TPlugIn> const& plugIns) {
   return json;
 }
 
-// Adds the instances of every namespace to the document, and the namespaces that failed while they were read.
-void AddInstances(TJson& document, std::vector<TPlugIn> const& plugIns) {
-  TJson& instances = document["instances"] = TJson::array();
-  TJson failures = TJson::array();
-  for (TNamespaceView const& view : ViewsOf(plugIns)) {
-    TInstanceJson json(view);
-    std::string const failure = FailureOf([&] {
-      for (auto const& instance : view.AllInstances()) instances.push_back(json.Of(*instance));
-    });
-    if (!failure.empty()) failures.push_back({{"provider", view.GetProviderName()}, {"error", failure}});
-  }
-  if (!failures.empty()) document["instanceFailures"] = failures;
+constexpr char const* kLineOfInstances = "\n  \"instances\": ";  // in no text of the document, which has no line ends
+
+// The lines of the document, indented as an element of an array in a member of the outermost object.
+void AppendElement(std::string& array, std::string_view lines) {
+  constexpr char const* indentation = "\n    ";
+  if (!array.empty()) array += ',';
+  array += indentation;
+  lines.remove_suffix(1);  // the last line end
+  for (std::size_t end; (end = lines.find('\n')) != lines.npos; lines.remove_prefix(end + 1))
+    array.append(lines.substr(0, end)).append(indentation);
+  array += lines;
 }
 
 }  // namespace
 
-TJson ReportAsJson(TReport const& report) {
+TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fMessages(messages) {
   EExitStatus const status = ExitStatusOf(report.fCompleteness);
-  TJson document = DocumentHead("zep report", status, WhyNotComplete(report), SampleLabelOf(report));
-  document["status"] = NameOf(status);
-  document["head"] = HeadLines(report);
-  document["smbiosTableFile"] = OrNull(report.fTableFile);
-  document["findings"] = FindingsAsJson(report.fFindings);
-  document["identity"] = RowsAsJson(report.fIdentity);
-  document["details"] = RowsAsJson(report.fDetails);
-  document["plugInDirectory"] = PlugInDirectory();
-  document["plugIns"] = PlugInsAsJson(report.fPlugIns);
-  AddInstances(document, report.fPlugIns);
-  return document;
+  fMembers = DocumentHead("zep report", status, WhyNotComplete(report), SampleLabelOf(report));
+  fMembers["status"] = NameOf(status);
+  fMembers["head"] = HeadLines(report);
+  fMembers["smbiosTableFile"] = OrNull(report.fTableFile);
+  fMembers["findings"] = FindingsAsJson(report.fFindings);
+  fMembers["identity"] = RowsAsJson(report.fIdentity);
+  fMembers["details"] = RowsAsJson(report.fDetails);
+  fMembers["plugInDirectory"] = PlugInDirectory();
+  fMembers["plugIns"] = PlugInsAsJson(report.fPlugIns);
+  AddInstances(report.fPlugIns);
+}
+
+// Also adds the namespaces that failed while they were read.
+void TReportDocument::AddInstances(std::vector<TPlugIn> const& plugIns) {
+  fMembers["instances"] = nullptr;
+  TJson failures = TJson::array();
+  for (TNamespaceView const& view : ViewsOf(plugIns)) {
+    TInstanceJson json(view);
+    std::string const failure = FailureOf([&] {
+      for (auto const& instance : view.AllInstances()) {
+        TJson element = json.Of(*instance);
+        AppendElement(fInstances, fMessages == EMessages::kVerbatim ? AsVerbatimText(element) : AsText(std::move(element)));
+      }
+    });
+    if (!failure.empty()) failures.push_back({{"provider", view.GetProviderName()}, {"error", failure}});
+  }
+  if (!failures.empty()) fMembers["instanceFailures"] = failures;
+}
+
+std::string TReportDocument::Text() const {
+  std::string text = fMessages == EMessages::kVerbatim ? AsVerbatimText(fMembers) : AsText(fMembers);
+  std::size_t const line = text.find(kLineOfInstances);
+  if (line == text.npos) return text;
+  std::string const array = fInstances.empty() ? "[]" : "[" + fInstances + "\n  ]";
+  return text.replace(line + std::strlen(kLineOfInstances), std::strlen("null"), array);
 }
 
 }  // namespace NQRVZEP20::zep

@@ -19,7 +19,7 @@ namespace {
 
 void WriteReport(TReport const& report, std::string const& file) {
   std::ofstream stream(file, std::ios::binary);
-  stream << Gzipped(AsVerbatimText(ReportAsJson(report)));
+  stream << Gzipped(TReportDocument(report, EMessages::kVerbatim).Text());
   stream.close();
   if (!stream) throw std::system_error(errno, std::generic_category(), file);
 }

@@ -48,7 +48,7 @@ TEST(SendReportTest, IsKeptAlsoWhenSendingThrows) {
   EXPECT_THAT(sent.fKeptIn, testing::StartsWith(dir.Path()));
   EXPECT_EQ(testing::internal::GetCapturedStderr(),
             "zep: a pipe cannot be created: Too many open files\nzep: the report is kept in " + sent.fKeptIn + "\n");
-  EXPECT_EQ(ReadFile(sent.fKeptIn), Gzipped(AsText(ReportAsJson(report))));
+  EXPECT_EQ(ReadFile(sent.fKeptIn), Gzipped(TReportDocument(report, EMessages::kVerbatim).Text()));
 }
 
 TEST(SendReportTest, TheReasonTellsWhetherTheReportHasArrived) {
