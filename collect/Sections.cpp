@@ -262,12 +262,13 @@ bool IsShownElsewhere(boost::shared_ptr<ICIMClass const> const& cls) {
 }
 
 void AddOtherClasses(TReportSection& section, TNamespaceView const& view) {
-  std::map<std::string, std::size_t> counts;
-  for (TInstancePtr const& instance : view.AllInstances()) {
-    auto const cls = instance->GetClass(TCIMContext());
-    if (!IsShownElsewhere(cls) && view.IsOfReport(*instance)) ++counts[cls->GetName(TCIMContext())];
-  }
-  for (auto const& [name, count] : counts)
+  std::map<boost::shared_ptr<ICIMClass>, std::size_t> counts;
+  for (TInstancePtr const& instance : view.AllInstances())
+    if (view.IsOfReport(*instance)) ++counts[instance->GetClass(TCIMContext())];
+  std::map<std::string, std::size_t> others;
+  for (auto const& [cls, count] : counts)
+    if (!IsShownElsewhere(cls)) others[cls->GetName(TCIMContext())] += count;
+  for (auto const& [name, count] : others)
     section.fRows.push_back({TCell::Known(name, ""), TCell::Known(std::to_string(count), ""), TCell::Known(view.GetName(), "")});
 }
 

@@ -9,6 +9,7 @@
 #include "TZEPException.h"
 #include "collect/SafeText.h"
 #include "collect/Sample.h"
+#include "collect/answer/TReceivedNamespace.h"
 
 #include <algorithm>
 
@@ -41,11 +42,12 @@ TNamespaceView::TNamespaceView(std::string providerName, boost::shared_ptr<ICIMN
     : fProviderName(std::move(providerName)),
       fNamespace(std::move(ns)),
       fSampleLabel(std::move(sampleLabel)),
-      fReasons(*fNamespace) {}
+      fReasons(std::make_shared<TReasonReader const>(*fNamespace)) {}
 
 std::string TNamespaceView::GetName() const { return fNamespace->GetName(TCIMContext()); }
 
 boost::shared_ptr<ICIMClass> TNamespaceView::FindClass(std::string const& name) const {
+  if (auto const* const received = dynamic_cast<TReceivedNamespace const*>(fNamespace.get())) return received->FindClass(name);
   try {
     return fNamespace->GetClass(name, TCIMContext());
   } catch (TZEPException const& failure) {
@@ -114,11 +116,11 @@ bool TNamespaceView::IsOfReport(ICIMInstance const& instance) const {
 }
 
 TMissing TNamespaceView::WhyMissing(ICIMInstance const& instance, std::string const& property) const {
-  return fReasons.WhyMissing(instance, property).value_or(TMissing{kMissingNotGiven, "the provider gives no value"});
+  return fReasons->WhyMissing(instance, property).value_or(TMissing{kMissingNotGiven, "the provider gives no value"});
 }
 
 TMissing TNamespaceView::WhyNoInstance(std::string const& className) const {
-  return fReasons.WhyNoInstance(className).value_or(TMissing{kMissingNotDescribed, "the provider describes no instances"});
+  return fReasons->WhyNoInstance(className).value_or(TMissing{kMissingNotDescribed, "the provider describes no instances"});
 }
 
 TAnswer<TCIMValue> TNamespaceView::Answer(ICIMInstance const& instance, std::string const& name) const {

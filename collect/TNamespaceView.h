@@ -7,6 +7,7 @@
 #include "collect/TAnswer.h"
 
 #include <map>
+#include <memory>
 #include <string>
 #include <unordered_map>
 #include <vector>
@@ -21,7 +22,7 @@ class ICIMPropertyDecl;
 // Sources and reasons are those that the provider recorded in its namespace (TReasonReader.h); otherwise the source is the
 // provider's name, and the reason is a generic one.
 //
-// Copies share ownership of the namespace. Use a view from one thread at a time, because PathOf caches. In all members,
+// Copies share the namespace and the reasons. Use a view from one thread at a time, because PathOf caches. In all members,
 // exceptions of the provider, which may be of any type (FailureOf.h), pass through; each call blocks as long as the provider
 // does.
 class TNamespaceView {
@@ -70,8 +71,8 @@ private:
 
   std::string fProviderName;
   boost::shared_ptr<ICIMNamespace> fNamespace;
-  std::string fSampleLabel;  // empty without a sample
-  TReasonReader fReasons;
+  std::string fSampleLabel;                       // empty without a sample
+  std::shared_ptr<TReasonReader const> fReasons;  // shared by copies
 
   struct TNumbered {
     std::vector<boost::shared_ptr<ICIMInstance>> fInstances;

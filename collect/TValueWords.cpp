@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/TValueWords.h"
 
+#include "CIMNames.h"
 #include "ICIMClass.h"
 #include "ICIMPropertyDecl.h"
 #include "ICIMQualifier.h"
-#include "TZEPException.h"
 
 #include <charconv>
 #include <optional>
@@ -17,25 +17,33 @@ namespace {
 using TNumber = long double;  // holds every 64-bit integer exactly
 using TPropertyDecl = boost::shared_ptr<ICIMPropertyDecl const>;
 
-// The declaration that this one overrides; empty when there is none.
-TPropertyDecl OverriddenBy(ICIMPropertyDecl const& property) {
-  auto const cls = boost::dynamic_pointer_cast<ICIMClass>(property.GetOwner(TCIMContext()).lock());
-  auto const superClass = cls ? cls->GetSuperClass(TCIMContext()) : nullptr;
-  if (!superClass) return {};
-  try {
-    return superClass->GetPropertyDecl(property.GetName(TCIMContext()), TCIMContext());
-  } catch (TZEPException const& failure) {
-    if (failure.GetStatusCode() != kZEPStatusNotFound) throw;
-    return {};
-  }
+// The class's own declaration of that property; empty when there is none. GetPropertyDecl would throw for a missing one, which
+// takes far longer.
+TPropertyDecl OwnDeclaration(ICIMClass const& cls, std::string const& property) {
+  TPropertyDecl own;
+  cls.EnumeratePropertyDecls(
+      [&](boost::shared_ptr<ICIMPropertyDecl> const& declaration) {
+        if (IsSameName(declaration->GetName(TCIMContext()), property)) own = declaration;
+        return !own;
+      },
+      TCIMContext());
+  return own;
+}
+
+// The property, and then those that it overrides, up to the first one that has the qualifier; null when none has it.
+boost::shared_ptr<ICIMQualifier> FindQualifier(ICIMPropertyDecl const& property, std::string const& name) {
+  auto qualifier = property.GetQualifier(name, TCIMContext());
+  auto const owner = boost::dynamic_pointer_cast<ICIMClass>(property.GetOwner(TCIMContext()).lock());
+  std::string const propertyName = property.GetName(TCIMContext());
+  auto cls = owner ? owner->GetSuperClass(TCIMContext()) : nullptr;
+  for (; cls && !qualifier; cls = cls->GetSuperClass(TCIMContext()))
+    if (auto const above = OwnDeclaration(*cls, propertyName)) qualifier = above->GetQualifier(name, TCIMContext());
+  return qualifier;
 }
 
 // The texts of a qualifier that is an array of strings, of the property itself or the nearest one that it overrides.
 std::vector<std::string> TextsOf(ICIMPropertyDecl const& property, std::string const& qualifierName) {
-  auto qualifier = property.GetQualifier(qualifierName, TCIMContext());
-  TPropertyDecl above = qualifier ? nullptr : OverriddenBy(property);
-  for (; above && !qualifier; above = OverriddenBy(*above)) qualifier = above->GetQualifier(qualifierName, TCIMContext());
-
+  auto const qualifier = FindQualifier(property, qualifierName);
   std::vector<std::string> texts;
   TCIMValue const value = qualifier ? qualifier->GetValue(TCIMContext()) : TCIMValue();
   if (value.IsNull() || !value.IsArray()) return texts;

@@ -31,10 +31,15 @@ boost::shared_ptr<ICIMClass> TReceivedNamespace::CreateClass(boost::shared_ptr<I
   RefuseChange();
 }
 
-boost::shared_ptr<ICIMClass> TReceivedNamespace::GetClass(std::string const& className, TCIMContext const&) const {
+boost::shared_ptr<ICIMClass> TReceivedNamespace::FindClass(std::string const& className) const {
   auto const found = fNumbers.find(className);
   if (found != fNumbers.end()) return fClasses[found->second];
   if (fClassesFailure) fClassesFailure->Throw();  // the class may be one that the provider did not name any more
+  return {};
+}
+
+boost::shared_ptr<ICIMClass> TReceivedNamespace::GetClass(std::string const& className, TCIMContext const&) const {
+  if (auto cls = FindClass(className)) return cls;
   throw TZEPException(kZEPStatusNotFound);
 }
 

@@ -49,6 +49,9 @@ public:
                                TCIMContext const& context) const override;
   boost::shared_ptr<ICIMInstance> GetInstance(TCIMReference const& path, TCIMContext const& context) const override;
 
+  // Like GetClass, but returns an empty pointer instead of throwing kZEPStatusNotFound, which takes far longer.
+  boost::shared_ptr<ICIMClass> FindClass(std::string const& className) const;
+
   // ---- For its elements ----
 
   TCIMValue ValueAt(std::size_t at) const;  // throws the recorded failure if there is no value

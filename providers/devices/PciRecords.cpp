@@ -127,8 +127,10 @@ TRecord FunctionRecord(char const* className, TComputerSystem const& system, std
   record.Add("DeviceNumber", TFinding<std::uint8_t>(address.fDevice));
   record.Add("FunctionNumber", TFinding<std::uint8_t>(address.fFunction));
   record.Add("CommandRegister", function.Configuration<std::uint16_t>(0x04));
-  record.Add("CacheLineSize", function.Configuration<std::uint8_t>(0x0c)).Unit("dataword * 2");
-  record.Add("LatencyTimer", function.Configuration<std::uint8_t>(0x0d)).Unit("cycle");
+  auto const cacheLineAndLatency = function.Configuration<std::uint16_t>(0x0c);  // one read: the hypervisor handles each
+  record.Add("CacheLineSize", cacheLineAndLatency.Then([](std::uint16_t both) { return std::uint8_t(both); }))
+      .Unit("dataword * 2");
+  record.Add("LatencyTimer", cacheLineAndLatency.Then([](std::uint16_t both) { return std::uint8_t(both >> 8); })).Unit("cycle");
   record.Add("InterruptPin", function.Configuration<std::uint8_t>(0x3d).Then([](std::uint8_t pin) { return std::uint16_t(pin); }))
       .Names(kInterruptPinNames);
   IdentifiersOf(function, names).AddTo(record);

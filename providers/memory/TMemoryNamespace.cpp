@@ -43,6 +43,8 @@ boost::shared_ptr<ICIMClass> TMemoryNamespace::GetClass(std::string const& class
   return FindClass(className);
 }
 
+bool TMemoryNamespace::HasClass(std::string const& className) const { return fClasses.Has(className); }
+
 void TMemoryNamespace::EnumerateClasses(boost::function<bool(boost::shared_ptr<ICIMClass>)> callback, TCIMContext const&) const {
   VisitEach(fRootClasses, callback);
 }

@@ -52,6 +52,9 @@ public:
   // own and is never found; a class may have several such instances.
   boost::shared_ptr<ICIMInstance> GetInstance(TCIMReference const& path, TCIMContext const& context) const override;
 
+  // Whether the namespace has the class. GetClass throws for a missing one, which takes far longer.
+  bool HasClass(std::string const& className) const;
+
   // ---- Filling. A refusal is logged as an error and throws a TZEPFailure whose reason names what was refused. ----
 
   // Creates a class, below `superClassName` unless that is empty, and returns a builder that describes it. The first call

@@ -8,7 +8,6 @@
 #include "TCIMReference.h"
 #include "TMemoryClass.h"
 #include "TMemoryNamespace.h"
-#include "TZEPException.h"
 
 namespace NQRVZEP20 {
 
@@ -79,18 +78,8 @@ TMemoryClassBuilder TRecordWriter::DefineClass(std::string const& name, std::str
   return builder;
 }
 
-bool TRecordWriter::HasClass(std::string const& name) const {
-  try {
-    fNamespace.GetClass(name, TCIMContext());
-    return true;
-  } catch (TZEPException const& failure) {
-    if (failure.GetStatusCode() != kZEPStatusNotFound) throw;
-    return false;
-  }
-}
-
 void TRecordWriter::EnsureClass(std::string const& name) {
-  if (!HasClass(name)) fWithoutRecords.emplace(name, DefineClass(name, ""));
+  if (!fNamespace.HasClass(name)) fWithoutRecords.emplace(name, DefineClass(name, ""));
 }
 
 // `values`: further values of the instance.
@@ -108,7 +97,7 @@ void TRecordWriter::Associate(TAssociation const& association, TRecord const& fi
 }
 
 void TRecordWriter::Associate(TAssociation const& association, TRecord const& first, TRecord const& second, TRecord const& more) {
-  if (!HasClass(association.fClassName) || fWithoutRecords.count(association.fClassName) > 0)
+  if (!fNamespace.HasClass(association.fClassName) || fWithoutRecords.count(association.fClassName) > 0)
     DeclareAssociation(association, more);
   AddInstance(more, {{association.fFirstName, ReferenceTo(first)}, {association.fSecondName, ReferenceTo(second)}});
 }

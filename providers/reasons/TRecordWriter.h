@@ -72,7 +72,6 @@ private:
   void Declare(TRecord const& shape);
   void AddInstance(TRecord const& record, TMemoryValues values = {});
 
-  bool HasClass(std::string const& name) const;
   TMemoryClassBuilder DefineClass(std::string const& name, std::string superClass);
   void EnsureClass(std::string const& name);
   void DeclareAssociation(TAssociation const& association, TRecord const& more);
