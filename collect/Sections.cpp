@@ -33,7 +33,8 @@ enum class ECell {
   kProperty,
   kIdentifier,  // the element of the array that has the description fOther
   kProduct,     // a size in bytes: the property times the property fOther
-  kEither       // the property fOther where the first has no value
+  kEither,      // the property fOther where the first has no value
+  kDescribed    // the property fOther where the value of the first is named "Other"
 };
 
 struct TColumn {
@@ -66,7 +67,7 @@ std::vector<TSubject> const& Subjects() {
        "CIM_PhysicalMemory",
        {{"Slot", "ElementName"},
         {"Size", "Capacity"},
-        {"Type", "MemoryType"},
+        {"Type", "MemoryType", ECell::kDescribed, "Description"},
         {"Speed", "ConfiguredMemoryClockSpeed"},
         {"Maker", "Manufacturer"},
         {"Part number", "PartNumber"},
@@ -195,12 +196,21 @@ TCell ProductCell(TNamespaceView const& view, ICIMInstance const& instance, std:
   return TCell::Known(TextWithUnit(TCIMValue(bytes), "byte"), left.fSource);
 }
 
+TCell DescribedCell(TNamespaceView const& view, ICIMInstance const& instance, std::string const& one, std::string const& other) {
+  TCell const cell = PropertyCell(view, instance, one);
+  if (!cell.IsKnown() || *cell.fValue != "Other") return cell;
+  TCell const description = PropertyCell(view, instance, other);
+  return description.IsKnown() ? description : cell;
+}
+
 TCell CellOf(TNamespaceView const& view, ICIMInstance const& instance, TColumn const& column) {
   switch (column.fCell) {
     case ECell::kIdentifier:
       return IdentifierCell(view, instance, column.fOther);
     case ECell::kProduct:
       return ProductCell(view, instance, column.fProperty, column.fOther);
+    case ECell::kDescribed:
+      return DescribedCell(view, instance, column.fProperty, column.fOther);
     case ECell::kEither:
       if (view.Answer(instance, column.fProperty).IsKnown()) break;
       return PropertyCell(view, instance, column.fOther);

@@ -109,6 +109,15 @@ TFinding<std::uint8_t> RegisterSpacingFrom(std::uint8_t modifier) {
   return bytes[modifier >> 6];
 }
 
+// The bit of the modifier as a word; missing when the firmware does not describe the interrupt.
+TFinding<std::string> InterruptWord(TSmbiosStructure const& interface, std::uint8_t bit, char const* set, char const* clear) {
+  constexpr std::uint8_t isDescribed = 0x08;
+  return interface.Byte(0x10).Then([=](std::uint8_t modifier) -> TFinding<std::string> {
+    if (!(modifier & isDescribed)) return TMissing{kMissingNotGiven, "the firmware does not describe the interrupt"};
+    return std::string(modifier & bit ? set : clear);
+  });
+}
+
 // ---- Onboard device ----
 
 constexpr char const* kDeviceTypes[] = {
@@ -194,6 +203,9 @@ TRecord IpmiRecord(TSmbiosStructure const& interface, std::string const& source,
   record.Add("IsMemoryMapped", IsMemoryMapped(interface));
   record.Add("RegisterSpacing", interface.Byte(0x10).Then(RegisterSpacingFrom)).Unit("byte");
   record.Add("InterruptNumber", NumberOf<std::uint8_t>(interface.Byte(0x11), std::uint8_t(0)));
+  record.Add("InterruptPolarity", InterruptWord(interface, 0x02, "Active High", "Active Low"));
+  record.Add("InterruptTrigger", InterruptWord(interface, 0x01, "Level", "Edge"));
+  record.Add("NVStorageAddress", NumberOf<std::uint8_t>(interface.Byte(0x07), std::uint8_t(0xff)));
   return record;
 }
 

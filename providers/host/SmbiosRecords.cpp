@@ -178,6 +178,15 @@ TFinding<std::uint16_t> CimNumberOf(TFinding<std::uint8_t> const& found, int con
   });
 }
 
+// The schema's name, or that of SMBIOS for the types after the end of the schema's list.
+TFinding<std::string> MemoryTypeNameFrom(std::uint8_t type) {
+  constexpr char const* newer[] = {"Logical non-volatile device", "HBM", "HBM2", "DDR5", "LPDDR5", "HBM3"};
+  if (type >= std::size(kMemoryTypes)) return WordFor(type, newer, std::size(kMemoryTypes), "memory type");
+  return CimNumberOf(TFinding<std::uint8_t>(type), kMemoryTypes).Then([](std::uint16_t number) {
+    return std::string(kMemoryTypeNames[number].fName);
+  });
+}
+
 // The highest bit of the extended fields is reserved.
 std::uint32_t WithoutReservedBit(std::uint32_t number) { return number & 0x7fffffff; }
 
@@ -276,6 +285,7 @@ TRecord MemoryRecord(TSmbiosStructure const& memoryDevice, std::string const& so
   record.Add("Capacity", CapacityOf(memoryDevice)).Unit("byte");
   record.Add("FormFactor", CimNumberOf(memoryDevice.Byte(0x0e), kFormFactors)).Names(kFormFactorNames);
   record.Add("MemoryType", CimNumberOf(memoryDevice.Byte(0x12), kMemoryTypes)).Names(kMemoryTypeNames);
+  record.Add("Description", memoryDevice.Byte(0x12).Then(MemoryTypeNameFrom));
   record.Add("TotalWidth", NumberOf<std::uint16_t>(memoryDevice.Word(0x08), std::uint16_t(0xffff))).Unit("bit");
   record.Add("DataWidth", NumberOf<std::uint16_t>(memoryDevice.Word(0x0a), std::uint16_t(0xffff))).Unit("bit");
 

@@ -14,6 +14,7 @@ namespace NQRVZEP20 {
 namespace {
 
 using testing::ElementsAre;
+using testing::HasSubstr;
 using testing::IsEmpty;
 
 class SectionsTest : public testing::Test {
@@ -42,14 +43,16 @@ protected:
   mutable std::string fWhyEmpty;
 };
 
-constexpr TValueName kTypes[] = {{"24", "DDR3"}, {"26", "DDR4"}};
+constexpr TValueName kTypes[] = {{"1", "Other"}, {"26", "DDR4"}};
 
-TRecord Module(std::string const& slot, TFinding<unsigned long> const& capacity) {
+TRecord Module(std::string const& slot, TFinding<unsigned long> const& capacity, unsigned short type = 26,
+               TFinding<std::string> const& description = std::string("DDR4 of the firmware")) {
   TRecord record("CIM_PhysicalMemory", "SMBIOS type 17");
   record.AddKey("Tag", slot);
   record.Add("ElementName", TFinding<std::string>(slot));
   record.Add("Capacity", capacity).Unit("byte");
-  record.Add("MemoryType", TFinding<unsigned short>(26)).Names(kTypes);
+  record.Add("MemoryType", TFinding<unsigned short>(type)).Names(kTypes);
+  record.Add("Description", description);
   record.Add("ConfiguredMemoryClockSpeed", TFinding<unsigned>(2933)).Unit("hertz * 10^6");
   record.Add("Manufacturer", TFinding<std::string>("Example Works"));
   record.Add("PartNumber", TFinding<std::string>("EX-16"));
@@ -63,6 +66,12 @@ TEST_F(SectionsTest, EachInstanceIsARowWithUnitsNamesAndReasons) {
   fWriter.WriteMissing();
   EXPECT_THAT(Rows("memory"), ElementsAre("DIMM 1|16 GiB|DDR4|2.933 GHz|Example Works|EX-16|<placeholder text \"0\">",
                                           "DIMM 2|<unknown size>|DDR4|2.933 GHz|Example Works|EX-16|<placeholder text \"0\">"));
+}
+
+TEST_F(SectionsTest, TheDescriptionNamesAnotherMemoryType) {
+  fWriter.Write(Module("", 0ul), {Module("DIMM 1", 1ul, 1, std::string("DDR5")), Module("DIMM 2", 1ul, 1, TMissing())}, {});
+  fWriter.WriteMissing();
+  EXPECT_THAT(Rows("memory"), ElementsAre(HasSubstr("|DDR5|"), HasSubstr("|Other|")));
 }
 
 TEST_F(SectionsTest, TheTitleAndColumnsAreGiven) {

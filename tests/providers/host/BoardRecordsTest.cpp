@@ -113,7 +113,8 @@ TEST(BoardRecordsTest, AnOnboardDeviceHasItsPlace) {
 
 TEST(BoardRecordsTest, AnIpmiInterfaceHasItsAddress) {
   TStructureMaker maker(38, 0x12);
-  maker.Byte(0x04, 1).Byte(0x05, 0x20).Byte(0x06, 0x20).Bytes(0x08, LittleEndian(0xca3, 8)).Byte(0x10, 0x41).Byte(0x11, 5);
+  maker.Byte(0x04, 1).Byte(0x05, 0x20).Byte(0x06, 0x20).Byte(0x07, 0xa0).Bytes(0x08, LittleEndian(0xca3, 8));
+  maker.Byte(0x10, 0x49).Byte(0x11, 5);
   TSystemName const name{"db1", "uname"};
   ExpectProperties(IpmiRecord(maker.Make(), "SMBIOS type 38", 0, name), {{"DeviceID", "string IPMI interface 0"},
                                                                          {"InterfaceType", "string KCS"},
@@ -122,7 +123,16 @@ TEST(BoardRecordsTest, AnIpmiInterfaceHasItsAddress) {
                                                                          {"BaseAddress", "uint64 3234"},
                                                                          {"IsMemoryMapped", "boolean false"},
                                                                          {"RegisterSpacing", "uint8 4"},
-                                                                         {"InterruptNumber", "uint8 5"}});
+                                                                         {"InterruptNumber", "uint8 5"},
+                                                                         {"InterruptPolarity", "string Active Low"},
+                                                                         {"InterruptTrigger", "string Level"},
+                                                                         {"NVStorageAddress", "uint8 160"}});
+  ExpectProperties(IpmiRecord(TStructureMaker(38, 0x12).Byte(0x07, 0xff).Byte(0x10, 0x0a).Make(), "SMBIOS type 38", 0, name),
+                   {{"InterruptPolarity", "string Active High"},
+                    {"InterruptTrigger", "string Edge"},
+                    {"NVStorageAddress", "uint8 NULL not-given: the firmware reports it as unknown"}});
+  ExpectProperties(IpmiRecord(TStructureMaker(38, 0x12).Make(), "SMBIOS type 38", 0, name),
+                   {{"InterruptPolarity", "string NULL not-given: the firmware does not describe the interrupt"}});
   maker.Byte(0x10, 0x10);
   EXPECT_EQ(PropertyOf(IpmiRecord(maker.Make(), "", 0, name), "BaseAddress"), "uint64 3235") << "the lowest bit is set";
 }
@@ -138,12 +148,12 @@ TEST(BoardRecordsTest, NothingIsReadOutsideAStructure) {
            OnboardDeviceRecord(structure, "", 0).GetProperties().size() +
            IpmiRecord(structure, "", 0, TSystemName{"db1", "uname"}).GetProperties().size();
   };
-  for (std::size_t length = 0; length <= seed.size(); ++length) EXPECT_EQ(read(seed.substr(0, length)), 45u) << length;
+  for (std::size_t length = 0; length <= seed.size(); ++length) EXPECT_EQ(read(seed.substr(0, length)), 48u) << length;
   for (std::size_t at = 0; at < seed.size(); ++at)
     for (int byte : {0x00, 0x01, 0x7f, 0x80, 0xff}) {
       std::string changed = seed;
       changed[at] = static_cast<char>(byte);
-      EXPECT_EQ(read(changed), 45u) << at;
+      EXPECT_EQ(read(changed), 48u) << at;
     }
 }
 

@@ -35,6 +35,7 @@ std::vector<std::string> KeysOf(TRecord const& record) {
 }
 
 using testing::ElementsAre;
+using testing::HasSubstr;
 
 // ---- System ----
 
@@ -301,6 +302,7 @@ TEST(MemoryRecordTest, EveryFieldIsReadAtItsOffset) {
                             {"Capacity", "uint64 17179869184"},
                             {"FormFactor", "uint16 8"},
                             {"MemoryType", "uint16 26"},
+                            {"Description", "string DDR4"},
                             {"TotalWidth", "uint16 72"},
                             {"DataWidth", "uint16 64"},
                             {"IsSpeedInMhz", "boolean true"},
@@ -364,6 +366,15 @@ TEST(MemoryRecordTest, KindsHaveTheNumbersOfCim) {
     EXPECT_EQ(ModuleProperty(Module().Byte(0x0e, row.fSmbios), "FormFactor"), "uint16 " + row.fCim) << row.fSmbios;
 }
 
+TEST(MemoryRecordTest, TheDescriptionNamesTypesThatCimDoesNotNumber) {
+  EXPECT_EQ(ModuleProperty(Module().Byte(0x12, 0x18), "Description"), "string DDR3");
+  EXPECT_EQ(ModuleProperty(Module().Byte(0x12, 0x20), "Description"), "string HBM");
+  EXPECT_EQ(ModuleProperty(Module().Byte(0x12, 0x22), "Description"), "string DDR5");
+  EXPECT_EQ(ModuleProperty(Module().Byte(0x12, 0x24), "Description"), "string HBM3");
+  EXPECT_EQ(ModuleProperty(Module().Byte(0x12, 0x02), "Description"), std::string("string ") + kUnknown);
+  EXPECT_THAT(ModuleProperty(Module().Byte(0x12, 0xf0), "Description"), HasSubstr("memory type 240"));
+}
+
 TEST(MemoryRecordTest, UnknownWidthsAreNull) {
   EXPECT_EQ(ModuleProperty(Module().Word(0x08, 0xffff), "TotalWidth"), std::string("uint16 ") + kUnknown);
   EXPECT_EQ(ModuleProperty(Module().Word(0x0a, 0xffff), "DataWidth"), std::string("uint16 ") + kUnknown);
@@ -414,12 +425,12 @@ TEST(SmbiosRecordsTest, NothingIsReadOutsideAStructure) {
   std::string const seeds[] = {System().Text(0x05, "Server").Table(), Chassis().Byte(0x13, 1).Table(),
                                Module().Word(0x0c, 0x7fff).Table()};
   for (std::string const& seed : seeds) {
-    for (std::size_t length = 0; length <= seed.size(); ++length) EXPECT_EQ(readAll(seed.substr(0, length)), 48u) << length;
+    for (std::size_t length = 0; length <= seed.size(); ++length) EXPECT_EQ(readAll(seed.substr(0, length)), 49u) << length;
     for (std::size_t at = 0; at < seed.size(); ++at)
       for (int byte : {0x00, 0x01, 0x7f, 0x80, 0xff}) {
         std::string changed = seed;
         changed[at] = static_cast<char>(byte);
-        EXPECT_EQ(readAll(changed), 48u) << at;
+        EXPECT_EQ(readAll(changed), 49u) << at;
       }
   }
 }
