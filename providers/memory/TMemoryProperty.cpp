@@ -13,21 +13,19 @@ namespace NQRVZEP20 {
 TMemoryProperty::TMemoryProperty(boost::shared_ptr<TMemoryPropertyDecl const> declaration)
     : fDeclaration(declaration), fValue(declaration->GetDefaultValue(TCIMContext())) {}
 
-TCIMValue TMemoryProperty::GetValue(TCIMContext const&) const { return fValue; }
+TCIMValue TMemoryProperty::GetValue(TCIMContext const&) const { return fValue.Get(); }
 
 void TMemoryProperty::SetValue(TCIMValue const& value, TCIMContext const&) {
   if (fIsFixed) throw TZEPException(kZEPStatusInvalidOpSequence);
   if (value.GetType() != fValue.GetType()) throw TZEPFailure(kZEPStatusTypeMismatch, WhyNotOf(fValue.GetType(), value));
-
-  // An assignment of an equal value changes nothing, and any two char16 are equal. Therefore the old value is dropped first.
-  TCIMValue copy(value);
-  fValue.SetNullValue(TCIMValue::TCIMType::kCIMTypeInvalid, 0);
-  fValue = std::move(copy);
+  fValue = TStoredValue(value);
 }
 
 void TMemoryProperty::DropReference() {
-  TCIMValue::TCIMType const type = fValue.GetType();
-  if (BaseTypeOf(type) == TCIMValue::TCIMType::kCIMTypeReference) fValue.SetNullValue(type, fValue.GetMaxArraySize());
+  if (BaseTypeOf(fValue.GetType()) != TCIMValue::TCIMType::kCIMTypeReference) return;
+  TCIMValue null = fValue.Get();
+  null.SetNullValue(null.GetType(), null.GetMaxArraySize());
+  fValue = TStoredValue(null);
 }
 
 std::string TMemoryProperty::GetName(TCIMContext const& context) const { return fDeclaration->GetName(context); }

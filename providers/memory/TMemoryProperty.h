@@ -2,7 +2,7 @@
 #pragma once
 
 #include "ICIMProperty.h"
-#include "TCIMValue.h"
+#include "TStoredValue.h"
 
 namespace NQRVZEP20 {
 
@@ -29,7 +29,7 @@ public:
 
 private:
   boost::shared_ptr<TMemoryPropertyDecl const> fDeclaration;
-  TCIMValue fValue;  // always of the declared type
+  TStoredValue fValue;  // always of the declared type
   bool fIsFixed = false;
 };
 

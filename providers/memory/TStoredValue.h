@@ -3,13 +3,14 @@
 
 #include "TCIMValue.h"
 
+#include <cstdint>
 #include <memory>
 #include <variant>
 
 namespace NQRVZEP20 {
 
-// A value in less memory than a TCIMValue takes, for values that are rarely read: Get creates the TCIMValue. Most values of
-// schemas are NULL, booleans, strings and arrays of strings.
+// A value in less memory than a TCIMValue takes: Get creates the TCIMValue. A number is kept in place, a string or an array of
+// numbers or strings in one block of memory, and everything else, such as a datetime or a reference, as a TCIMValue.
 class TStoredValue {
 public:
   explicit TStoredValue(TCIMValue const& value);
@@ -19,12 +20,12 @@ public:
   bool IsFalse() const;  // the boolean value false
 
 private:
-  struct TNull {};                           // without a referenced class
-  using TStrings = std::unique_ptr<char[]>;  // the count, then each length and text; the numbers have four bytes
+  struct TNull {};  // without a referenced class
+  using TBlock = std::unique_ptr<char[]>;
 
   TCIMValue::TCIMType fType;
   unsigned int fMaxArraySize;
-  std::variant<TNull, bool, TStrings, std::unique_ptr<TCIMValue>> fData;
+  std::variant<TNull, std::uint64_t, TBlock, std::unique_ptr<TCIMValue>> fData;
 };
 
 }  // namespace NQRVZEP20
