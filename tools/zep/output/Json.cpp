@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <cmath>
 #include <iterator>
+#include <string_view>
 
 namespace NQRVZEP20::zep {
 
@@ -42,15 +43,16 @@ TJson WordsAsJson(TValueWords const& words, TCIMValue const& value) {
 }
 
 // Whether the member contains a message or repeats an argument. All others contain data, which is printed unchanged.
-bool IsMessage(std::string const& key) {
-  constexpr char const* kMessages[] = {"reason", "error", "failure", "lastLogLine", "words", "host", "url", "proxy", "command"};
+bool IsMessage(std::string_view key) {
+  constexpr std::string_view kMessages[] = {"reason", "error", "failure", "lastLogLine", "words",
+                                            "host",   "url",   "proxy",   "command"};
   return std::find(std::begin(kMessages), std::end(kMessages), key) != std::end(kMessages);
 }
 
 void HideSecretsIn(TJson& json, bool isMessage = false) {
   if (json.is_string() && isMessage) json = MessageWithoutSecrets(json.get<std::string>());
   if (json.is_object())
-    for (auto& [key, value] : json.items()) HideSecretsIn(value, IsMessage(key));
+    for (auto& [key, value] : json.get_ref<TJson::object_t&>()) HideSecretsIn(value, IsMessage(key));
   else if (json.is_array())
     for (TJson& value : json) HideSecretsIn(value, isMessage);
 }

@@ -64,7 +64,9 @@ TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fM
 
 // Also adds the namespaces that failed while they were read.
 void TReportDocument::AddInstances(std::vector<TPlugIn> const& plugIns) {
+  constexpr std::size_t usualSize = std::size_t(1) << 20;
   fMembers["instances"] = nullptr;
+  fInstances.reserve(usualSize);  // growing, it would copy itself into new pages many times
   TJson failures = TJson::array();
   for (TNamespaceView const& view : ViewsOf(plugIns)) {
     TInstanceJson json(view);
@@ -83,8 +85,11 @@ std::string TReportDocument::Text() const {
   std::string text = fMessages == EMessages::kVerbatim ? AsVerbatimText(fMembers) : AsText(fMembers);
   std::size_t const line = text.find(kLineOfInstances);
   if (line == text.npos) return text;
-  std::string const array = fInstances.empty() ? "[]" : "[" + fInstances + "\n  ]";
-  return text.replace(line + std::strlen(kLineOfInstances), std::strlen("null"), array);
+  std::size_t const begin = line + std::strlen(kLineOfInstances);
+  std::string const rest = text.substr(begin + std::strlen("null"));
+  text.resize(begin);
+  text.reserve(begin + fInstances.size() + rest.size() + 8);
+  return text.append("[").append(fInstances).append(fInstances.empty() ? "]" : "\n  ]").append(rest);
 }
 
 }  // namespace NQRVZEP20::zep
