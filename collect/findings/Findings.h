@@ -42,6 +42,9 @@ std::string NameOf(TRuleResult::EOutcome outcome);
 // The rules of this library, in a fixed order. A front end may add its own.
 std::vector<TRule> StandardRules();
 
+// Those of them that a management controller can answer alone.
+std::vector<TRule> ControllerRules();
+
 // Asks every rule. A rule that throws, or whose provider throws, counts as not asked, with the reason; the problems that it has
 // found until then are kept. Blocks while the rules read the namespaces. Use the views from no other thread meanwhile.
 TFindings MakeFindings(std::vector<TNamespaceView> const& views, TThresholds const& thresholds = {},

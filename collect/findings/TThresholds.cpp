@@ -24,6 +24,7 @@ constexpr TSetting kSettings[] = {
     {"finding-corrected-memory-errors", &TThresholds::fCorrectedMemoryErrors, 1000000000},
     {"finding-corrected-pci-errors", &TThresholds::fCorrectedPciErrors, 1000000000},
     {"finding-kernel-log-days", &TThresholds::fKernelLogDays, 1000000},
+    {"finding-event-log-days", &TThresholds::fEventLogDays, 1000000},
     {"finding-clock-grace-minutes", &TThresholds::fClockGraceMinutes, 1000000},
 };
 

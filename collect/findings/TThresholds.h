@@ -20,6 +20,7 @@ struct TThresholds {
   std::uint64_t fCorrectedMemoryErrors = 100;  // of a memory module
   std::uint64_t fCorrectedPciErrors = 1000;    // of a PCI Express device
   std::uint64_t fKernelLogDays = 7;            // after which a record of the kernel's log is no longer judged
+  std::uint64_t fEventLogDays = 30;            // the same for an entry of the event log of a management controller
   std::uint64_t fClockGraceMinutes = 15;       // after the start, in which the clock need not be synchronised
 
   // The defaults, replaced by the settings that the callback has: it gets a key such as "finding-file-system-free-percent" and

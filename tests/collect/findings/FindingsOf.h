@@ -42,8 +42,13 @@ inline constexpr char const* kRuleClasses = R"(
   class CIM_PCIDevice { [key] string DeviceID; uint8 ClassCode; };
   class ZEP_PCIExpressLink { [key] string DeviceID; uint16 Width; uint16 MaxWidth; real32 TransferRate; real32 MaxTransferRate; };
   [association] class CIM_ControlledBy { [key] CIM_PCIDevice ref Antecedent; [key] CIM_PCIDevice ref Dependent; };
-  class CIM_NumericSensor { [key] string DeviceID; string ElementName; uint16 SensorType; string CurrentState;
-    sint32 CurrentReading; };
+  class CIM_Sensor { [key] string DeviceID; string ElementName; uint16 SensorType; string OtherSensorTypeDescription;
+    string CurrentState; uint16 OperationalStatus[]; };
+  class CIM_NumericSensor : CIM_Sensor { sint32 CurrentReading; sint32 UnitModifier; };
+  class ZEP_ManagementController { [key] string DeviceID; };
+  class ZEP_ControllerAccount { [key] string Name; string UserID; uint16 EnabledState; string Privilege; boolean HasLANAccess; };
+  class ZEP_EventLog { [key] string InstanceID; uint64 FreeRecords; boolean HasLostRecords; datetime ClockTime; };
+  class ZEP_EventLogEntry { [key] string RecordID; string RecordData; uint16 PerceivedSeverity; uint64 Age; boolean HasEnded; };
   class ZEP_MemoryErrors { [key] string InstanceID; string ElementName; uint64 CorrectedErrors; uint64 UncorrectedErrors; };
   class ZEP_PCIErrors { [key] string InstanceID; string ElementName; uint64 CorrectableErrors; uint64 NonFatalErrors;
     uint64 FatalErrors; };

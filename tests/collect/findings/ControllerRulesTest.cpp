@@ -1,0 +1,106 @@
+// SPDX-License-Identifier: Apache-2.0
+
+// The rules about the management controller, with instances that show a problem, that show none, and without a controller.
+
+#include "tests/collect/findings/FindingsOf.h"
+
+#include <gmock/gmock.h>
+
+namespace NQRVZEP20 {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+constexpr int kDay = 86400;
+constexpr int kWarning = 3, kCritical = 6;
+
+std::string OnController(std::string const& instances) {
+  return "instance of ZEP_ManagementController { DeviceID = \"c\"; };" + instances;
+}
+
+std::string Entry(int number, std::string const& text, int severity, int age, bool hasEnded = false) {
+  return "instance of ZEP_EventLogEntry { RecordID = \"" + std::to_string(number) + "\"; RecordData = \"" + text +
+         "\"; PerceivedSeverity = " + std::to_string(severity) + "; Age = " + std::to_string(age) +
+         "; HasEnded = " + (hasEnded ? "true" : "false") + "; };";
+}
+
+TEST(ControllerRulesTest, ACriticalEntryIsNamedWithItsAge) {
+  std::string const rule = "event-log-critical", event = "CPU Temp: Upper Critical - going high, asserted";
+  EXPECT_THAT(Problems(rule, OnController(Entry(1, event + "; reading 95", kCritical, 5 * kDay) +
+                                          Entry(2, event + "; reading 91", kCritical, 2 * kDay))),
+              ElementsAre("error: the controller's event log has a critical entry: " + event + " (2 days ago, the last of 2)"));
+  EXPECT_THAT(Problems(rule, OnController(Entry(1, event, kCritical, 10))),
+              ElementsAre("error: the controller's event log has a critical entry: " + event + " (less than a day ago)"));
+  EXPECT_THAT(Problems(rule, OnController(Entry(1, event, kWarning, 10))), IsEmpty());
+  EXPECT_THAT(Problems(rule, OnController(Entry(1, event, kCritical, 10, true))), IsEmpty()) << "the state has ended";
+  EXPECT_THAT(Problems(rule, OnController(Entry(1, event, kCritical, 31 * kDay))), IsEmpty());
+  TThresholds thresholds;
+  thresholds.fEventLogDays = 40;
+  EXPECT_THAT(Problems(rule, OnController(Entry(1, event, kCritical, 31 * kDay)), thresholds), testing::SizeIs(1));
+}
+
+std::string Log(std::string const& state) {
+  return OnController("instance of ZEP_EventLog { InstanceID = \"l\"; " + state + " };");
+}
+
+TEST(ControllerRulesTest, AFullLogIsNamed) {
+  std::string const problem = "warning: the controller's event log is full, so that new events are lost";
+  EXPECT_THAT(Problems("event-log-full", Log("FreeRecords = 0; HasLostRecords = false;")), ElementsAre(problem));
+  EXPECT_THAT(Problems("event-log-full", Log("FreeRecords = 9; HasLostRecords = true;")), ElementsAre(problem));
+  EXPECT_THAT(Problems("event-log-full", Log("FreeRecords = 9; HasLostRecords = false;")), IsEmpty());
+}
+
+TEST(ControllerRulesTest, AClockThatIsNotSetIsNamed) {
+  std::string const missing =
+      R"(class ZEP_MissingValue { string ElementPath; string ElementProperty; string Code; string Reason; };
+    instance of ZEP_MissingValue { ElementPath = "ZEP_EventLog.InstanceID=\"l\""; ElementProperty = "ClockTime"; Code = ")";
+  EXPECT_THAT(Problems("controller-clock", Log("") + missing + "placeholder\"; Reason = \"not set\"; };"),
+              ElementsAre("warning: the clock of the management controller is not set"));
+  EXPECT_THAT(Problems("controller-clock", Log("") + missing + "no-answer\"; Reason = \"silence\"; };"), IsEmpty());
+  EXPECT_THAT(Problems("controller-clock", Log("ClockTime = \"20210201000000.000000+000\";")), IsEmpty());
+}
+
+std::string Account(std::string const& name, int state, std::string const& privilege, bool hasAccess = true) {
+  return OnController("instance of ZEP_ControllerAccount { Name = \"2\"; UserID = " + name +
+                      "; EnabledState = " + std::to_string(state) + "; Privilege = \"" + privilege +
+                      "\"; HasLANAccess = " + (hasAccess ? "true" : "false") + "; };");
+}
+
+TEST(ControllerRulesTest, AccountsThatAnyoneKnowsAreNamed) {
+  constexpr int enabled = 2, disabled = 3;
+  std::string const rule = "controller-account";
+  EXPECT_THAT(Problems(rule, Account("\"ADMIN\"", enabled, "Administrator")),
+              ElementsAre("information: the management controller has an account with a maker's usual name: ADMIN"));
+  EXPECT_THAT(Problems(rule, Account("NULL", enabled, "User")),
+              ElementsAre("warning: the management controller has an enabled account without a name (User)"));
+  EXPECT_THAT(Problems(rule, Account("\"ADMIN\"", disabled, "Administrator")), IsEmpty());
+  EXPECT_THAT(Problems(rule, Account("\"ADMIN\"", enabled, "User")), IsEmpty());
+  EXPECT_THAT(Problems(rule, Account("NULL", enabled, "User", false)), IsEmpty()) << "without access over the LAN";
+  EXPECT_THAT(Problems(rule, Account("\"alice\"", enabled, "Administrator")), IsEmpty());
+}
+
+std::string Sensor(std::string const& type, int status) {
+  return OnController("instance of CIM_Sensor { DeviceID = \"s\"; ElementName = \"PSU 1\"; OtherSensorTypeDescription = \"" +
+                      type + "\"; CurrentState = \"Power Supply Failure detected\"; OperationalStatus = {" +
+                      std::to_string(status) + "}; };");
+}
+
+TEST(ControllerRulesTest, AFailedPartIsNamed) {
+  constexpr int ok = 2, error = 6;
+  std::string const rule = "controller-part-failed";
+  EXPECT_THAT(Problems(rule, Sensor("Power Supply", error)),
+              ElementsAre("error: the controller reports a failure of PSU 1 (Power Supply): Power Supply Failure detected"));
+  EXPECT_THAT(Problems(rule, Sensor("Power Supply", ok)), IsEmpty());
+  EXPECT_THAT(Problems(rule, Sensor("System ACPI Power State", error)), IsEmpty());
+}
+
+TEST(ControllerRulesTest, AMachineWithoutAControllerIsFine) {
+  for (TRule const& rule : ControllerRules()) {
+    EXPECT_THAT(Problems(rule.fId, ""), IsEmpty()) << rule.fId;
+    EXPECT_EQ(Outcome(rule.fId, ""), "fine") << rule.fId;
+  }
+}
+
+}  // namespace
+}  // namespace NQRVZEP20
