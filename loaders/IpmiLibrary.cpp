@@ -3,6 +3,8 @@
 
 #include "loaders/TKeptLibrary.h"
 
+#include <algorithm>
+
 namespace NQRVZEP20 {
 namespace {
 
@@ -28,6 +30,12 @@ TIpmiResult Call(char const* name, TFunction TIpmiFunctions::*function, TArgumen
   return {{}, called(arguments...)};
 }
 
+TIpmiResult Send(TIpmiCommand const& command, TIpmiResponse& response, unsigned short& length, unsigned char& completionCode) {
+  response.fill(0);
+  return Call("SendIpmiCommand", &TIpmiFunctions::fSend, command.fCommand, command.fRequest.data(),
+              static_cast<int>(command.fRequest.size()), response.data(), &length, &completionCode, command.fNetFn);
+}
+
 }  // namespace
 
 TIpmiResult OpenIpmiConnection(std::string const& host, std::string const& user, std::string const& password) {
@@ -35,11 +43,22 @@ TIpmiResult OpenIpmiConnection(std::string const& host, std::string const& user,
 }
 
 TIpmiResult SendIpmiCommand(TIpmiCommand const& command, TIpmiResponse& response) {
-  response.fill(0);
   unsigned short length = 0;
   unsigned char completionCode = 0xFF;
-  return Call("SendIpmiCommand", &TIpmiFunctions::fSend, command.fCommand, command.fRequest.data(),
-              static_cast<int>(command.fRequest.size()), response.data(), &length, &completionCode, command.fNetFn);
+  return Send(command, response, length, completionCode);
+}
+
+TIpmiAnswer AskIpmiController(TIpmiCommand const& command) {
+  TIpmiResponse response;
+  unsigned short length = 0;
+  unsigned char completionCode = 0xFF;
+  TIpmiResult const result = Send(command, response, length, completionCode);
+  bool const isAnswered = result || (result.fLoad && result.fCode == kIpmiClientCompletionCode);
+  if (!isAnswered) return {};
+  std::size_t const count = std::min<std::size_t>(length, kIpmiClientResponseSize);
+  return {true,
+          result ? static_cast<unsigned char>(0) : completionCode,
+          {response.begin(), response.begin() + static_cast<long>(count)}};
 }
 
 TIpmiResult CloseIpmiConnection() { return Call("CloseConnection", &TIpmiFunctions::fClose); }

@@ -37,6 +37,14 @@ using TIpmiResponse = std::array<unsigned char, kIpmiClientResponseSize + 1>;
 
 TIpmiResult SendIpmiCommand(TIpmiCommand const& command, TIpmiResponse& response);
 
+// What the controller answered: the completion code and the data after it.
+struct TIpmiAnswer {
+  bool fIsAnswered = false;  // false if the command could not be sent, or was not answered
+  unsigned char fCompletionCode = 0xFF;
+  std::vector<unsigned char> fData = {};  // at most kIpmiClientResponseSize bytes
+};
+TIpmiAnswer AskIpmiController(TIpmiCommand const& command);
+
 TIpmiResult CloseIpmiConnection();
 
 }  // namespace NQRVZEP20

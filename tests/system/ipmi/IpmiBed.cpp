@@ -76,6 +76,7 @@ TSimulator::TSimulator(TSettings const& settings) {
                                         settings.fModel.c_str(),   "--serial", settings.fSerialNumber.c_str(), "--password",
                                         settings.fPassword.c_str()};
   if (!settings.fFru.empty()) arguments.insert(arguments.end(), {"--fru", settings.fFru.c_str()});
+  if (!settings.fMore.empty()) arguments.insert(arguments.end(), {"--more", settings.fMore.c_str()});
   arguments.insert(arguments.end(), {port.c_str(), nullptr});
   fScript = ::fork();
   if (fScript == 0) {

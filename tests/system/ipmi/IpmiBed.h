@@ -37,7 +37,8 @@ public:
     std::string fModel = "1234AB7";
     std::string fSerialNumber = "KQ12345";
     std::string fPassword = "zeppass1";
-    std::string fFru = {};  // a complete FRU image instead of the two texts
+    std::string fFru = {};   // a complete FRU image instead of the two texts
+    std::string fMore = {};  // a file with further commands for the simulator
   };
 
   explicit TSimulator(TSettings const& settings);

@@ -39,6 +39,7 @@ struct TArguments {
   int fParallel = 32;
   int fTimeoutSeconds = 120;
   bool fAsJson = false;
+  bool fHasInventory = false;
 };
 
 // The lines of the file that are neither empty nor comments, without blanks around them. A line that is not a host may contain a
@@ -112,17 +113,26 @@ void WriteDebugLog(std::string const& path) {
   TLogger::SetLogThreshold(ILogger::kLogDebug);
 }
 
+// A quarter of the time remains for the last command and for sending.
+TInventoryLimits InventoryLimitsOf(TArguments const& arguments) {
+  return {static_cast<unsigned>(arguments.fTimeoutSeconds) * 3 / 4, !arguments.fHost.empty() && CanRedrawErrors()};
+}
+
 using TReport = std::function<void(TRemoteIdentity const&)>;
 
 // Asks the controller of each host, and reports each as soon as it is known. Returns an EExitStatus.
 int AskAll(std::vector<std::string> const& hosts, TAccount const& account, TArguments const& arguments, TReport const& report) {
   IIPMILan::Initialize()->IpmilanCloseConnect();  // loads the IPMI client library once, for all processes
   std::size_t complete = 0, nothing = 0;
+  TInventoryLimits const inventory = InventoryLimitsOf(arguments);
   TProcessLimits const limits = {static_cast<std::size_t>(arguments.fParallel), arguments.fTimeoutSeconds};
   RunInProcesses(
-      hosts.size(), limits, [&](std::size_t item, TSend const& send) { QueryController(hosts[item], account, send); },
+      hosts.size(), limits,
+      [&](std::size_t item, TSend const& send) {
+        QueryController(hosts[item], account, arguments.fHasInventory ? &inventory : nullptr, send);
+      },
       [&](TProcessResult const& result) {
-        TRemoteIdentity identity = IdentityFrom(hosts[result.fItem], result.fOutput, result.fIsComplete);
+        TRemoteIdentity identity = IdentityFrom(hosts[result.fItem], result.fOutput, result.fIsComplete, arguments.fHasInventory);
         if (result.fIsTimeUp)
           identity.fError = "no result after " + std::to_string(arguments.fTimeoutSeconds) + " s; --timeout allows more";
         complete += IsComplete(identity);
@@ -183,6 +193,8 @@ TRun AddRemoteArguments(CLI::App& command) {
       ->capture_default_str();
   command.add_option("--debug-log", arguments->fDebugLog,
                      "Write the library's log, including debug lines, to this file, which only\nits owner can read");
+  command.add_flag("--inventory", arguments->fHasInventory,
+                   "Read the controller, its sensors, its event log and its FRU data, too");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.footer(
       "Queries the management controller of a server for machine type, model and serial number, over IPMI on the LAN (UDP\n"

@@ -71,6 +71,14 @@ std::string TakeField(std::string& sent) {
   return field;
 }
 
+// A host without a session has no inventory, for the reason that the identity has already.
+void AddInventoryTo(TRemoteIdentity& identity, std::string const& sent) {
+  identity.fInventory = InventoryFrom(sent);
+  std::string const& why = identity.fInventory->fWhyNotAll;
+  if (!why.empty() && (!sent.empty() || identity.fError.empty()))
+    identity.fError += (identity.fError.empty() ? "" : "; ") + ("inventory: " + why);
+}
+
 std::string OrUnknown(std::string const& field) { return field.empty() ? "unknown" : field; }
 
 }  // namespace
@@ -86,7 +94,7 @@ bool IsHostName(std::string const& host) {
   return isZone && ::inet_pton(AF_INET6, host.substr(0, zone).c_str(), &address) == 1;
 }
 
-void QueryController(std::string const& host, TAccount const& account, TSend const& send) {
+void QueryController(std::string const& host, TAccount const& account, TInventoryLimits const* inventory, TSend const& send) {
   if (!IsHostName(host)) return send(std::string(3, kEnd) + kNoHostName + kEnd);
   auto const start = TClock::now();
   std::string const why = WhyNoSession(host, account);
@@ -102,16 +110,18 @@ void QueryController(std::string const& host, TAccount const& account, TSend con
   add("machine type", type);
   add("model", TOSSpecific::GetRemoteMachineModel(host, account.fUser, password));
   add("serial number", TOSSpecific::GetRemoteMSN(host, account.fUser, password));
-  IIPMILan::GetInstance()->IpmilanCloseConnect();
   send(WhyNotAll(fields) + kEnd);
+  if (inventory != nullptr) SendInventory(host, *inventory, send);
+  IIPMILan::GetInstance()->IpmilanCloseConnect();
 }
 
-TRemoteIdentity IdentityFrom(std::string const& host, std::string const& sent, bool isComplete) {
+TRemoteIdentity IdentityFrom(std::string const& host, std::string const& sent, bool isComplete, bool hasInventory) {
   TRemoteIdentity identity;
   identity.fHost = host;
   std::string rest = sent;
   for (std::string* field : {&identity.fType, &identity.fModel, &identity.fSerialNumber, &identity.fError})
     *field = TakeField(rest);
+  if (hasInventory) AddInventoryTo(identity, rest);
   if (!isComplete) identity.fError = "the process that queried the controller exited before it had finished";
   return identity;
 }
@@ -119,6 +129,7 @@ TRemoteIdentity IdentityFrom(std::string const& host, std::string const& sent, b
 bool IsComplete(TRemoteIdentity const& identity) { return identity.fError.empty(); }
 
 bool IsNothing(TRemoteIdentity const& identity) {
+  if (identity.fInventory && identity.fInventory->fView) return false;
   return identity.fType.empty() && identity.fModel.empty() && identity.fSerialNumber.empty();
 }
 
@@ -134,6 +145,7 @@ TJson AsJson(TRemoteIdentity const& identity) {
   document["model"] = OrNull(identity.fModel);
   document["serialNumber"] = OrNull(identity.fSerialNumber);
   if (!identity.fError.empty()) document["error"] = identity.fError;  // the same reason, under the name of earlier versions
+  if (identity.fInventory) AddInventory(document, *identity.fInventory);
   return document;
 }
 
@@ -143,7 +155,7 @@ std::string AsText(TRemoteIdentity const& identity) {
   table.Add({"Machine type", OrUnknown(identity.fType)});
   table.Add({"Model", OrUnknown(identity.fModel)});
   table.Add({"Serial number", OrUnknown(identity.fSerialNumber)});
-  return table.GetText();
+  return table.GetText() + (identity.fInventory ? InventoryAsText(*identity.fInventory) : "");
 }
 
 }  // namespace NQRVZEP20::zep

@@ -1,10 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "tools/zep/controller/Inventory.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/processes/TChildProcess.h"
 #include "tools/zep/secrets/TSecret.h"
 
+#include <optional>
 #include <string>
 
 namespace NQRVZEP20::zep {
@@ -19,6 +21,7 @@ struct TRemoteIdentity {
   std::string fHost;
   std::string fType, fModel, fSerialNumber;  // empty if not reported
   std::string fError;                        // why a field was not reported; empty if all were
+  std::optional<TInventory> fInventory;      // only if it was requested
 };
 
 // Whether the string can be the name or the address of a host: it consists of letters, digits, "-", "." and "_", or is an IPv6
@@ -29,10 +32,11 @@ constexpr char const* kNoHostName =
 
 // Queries the controller and sends each field as soon as it is known, in the format that IdentityFrom parses. Call it in a
 // child process. Does not query a host for which IsHostName is false.
-void QueryController(std::string const& host, TAccount const& account, TSend const& send);
+// `inventory`: null if none is requested; otherwise the inventory follows the fields.
+void QueryController(std::string const& host, TAccount const& account, TInventoryLimits const* inventory, TSend const& send);
 
 // Parses the data that the child process sent. `isComplete` is false if the child did not finish.
-TRemoteIdentity IdentityFrom(std::string const& host, std::string const& sent, bool isComplete);
+TRemoteIdentity IdentityFrom(std::string const& host, std::string const& sent, bool isComplete, bool hasInventory = false);
 
 bool IsComplete(TRemoteIdentity const& identity);
 bool IsNothing(TRemoteIdentity const& identity);

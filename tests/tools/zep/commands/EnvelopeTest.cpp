@@ -122,6 +122,7 @@ TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
       {"zep media umount", 1, {"media", "umount", "--json", "/mnt/no-such-medium"}},
       {"zep config", 1, {"config", "--json", "no-such-key"}},
       {"zep remote", 1, {"remote", "--json", "192.0.2.1", "--user", "u"}},
+      {"zep remote", 1, {"remote", "--json", "192.0.2.1", "--user", "u", "--inventory"}},
       {"zep remote", 1, {"remote", "--json", "192.0.2.1", "--user", "u", "--password-file", "/nowhere"}},
       {"zep remote", 1, {"remote", "--json", "192.0.2.1", "--user", "u", "--password-file", "there"}},
       {"zep remote", 1, {"remote", "--json", "192.0.2.1", "--user", "u", "--password-file", "zep.cfg"}},
