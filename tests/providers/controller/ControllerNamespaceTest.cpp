@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "providers/controller/ControllerNamespace.h"
 
+#include "providers/controller/Connections.h"
 #include "tests/Support.h"
 #include "tests/providers/NamespaceText.h"
 #include "tests/providers/controller/FakeController.h"
@@ -124,6 +125,22 @@ TEST_F(ControllerNamespaceTest, AnswersOfAnyLengthAreHarmless) {
         cut, [](std::string const&) { return nullptr; }, [](char const*, std::size_t, std::size_t) {});
     EXPECT_NO_THROW(FillControllerNamespace(controller, TMachineFiles(fDir.Path()), *ns)) << length;
   }
+}
+
+// The answers of the controller of a virtual machine (QEMU's ipmi-bmc-sim with the records of three sensors and two events),
+// recorded through /dev/ipmi0.
+TEST_F(ControllerNamespaceTest, ARecordedControllerIsDescribed) {
+  TMachineFiles const files(SourcePath("tests/data/controller"));
+  auto const controller = ReadController(
+      Recorded(TIpmi(), files), [](std::string const&) { return nullptr; }, [](char const*, std::size_t, std::size_t) {});
+  FillControllerNamespace(controller, files, *fNs);
+  std::string const text = TextOf(*fNs);
+  for (char const* const line :
+       {"IPMIVersion: 2.0", "ElementName: PSU 1", "ElementName: Fan 1", "UpperThresholdCritical: 90",
+        "CurrentReading: <the controller refused the command 0x2d of network function 0x04 (completion code 0xcb)>",
+        "CurrentNumberOfRecords: 2", "FreeRecords: 126", "ClockTime: 20261122225220.000000+000",
+        "RecordData: PSU 1: Power Supply Failure detected, asserted", "Age: 1"})
+    EXPECT_THAT(text, HasSubstr(std::string("  ") + line + "\n"));
 }
 
 }  // namespace
