@@ -145,7 +145,7 @@ int Deliver(TReport const& report, TTarget const& target, TArguments const& argu
     document.Members()["exitStatus"] = static_cast<int>(status);
     document.Members()["reason"] = CountsOf(report.fFindings);
   }
-  if (arguments.fAsJson) WriteOutput(document.Text());
+  if (arguments.fAsJson) document.Write(WriteOutput);
   return status;
 }
 

@@ -35,10 +35,9 @@ TJson PlugInsAsJson(std::vector<TPlugIn> const& plugIns) {
 
 constexpr char const* kLineOfInstances = "\n  \"instances\": ";  // in no text of the document, which has no line ends
 
-// The lines of the document, indented as an element of an array in a member of the outermost object.
+// Appends the lines of a document, indented as an element of an array in a member of the outermost object.
 void AppendElement(std::string& array, std::string_view lines) {
   constexpr char const* indentation = "\n    ";
-  if (!array.empty()) array += ',';
   array += indentation;
   lines.remove_suffix(1);  // the last line end
   for (std::size_t end; (end = lines.find('\n')) != lines.npos; lines.remove_prefix(end + 1))
@@ -48,7 +47,7 @@ void AppendElement(std::string& array, std::string_view lines) {
 
 }  // namespace
 
-TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fMessages(messages) {
+TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fMessages(messages), fPlugIns(&report.fPlugIns) {
   EExitStatus const status = ExitStatusOf(report.fCompleteness);
   fMembers = DocumentHead("zep report", status, WhyNotComplete(report), SampleLabelOf(report));
   fMembers["status"] = NameOf(status);
@@ -59,37 +58,53 @@ TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fM
   fMembers["details"] = RowsAsJson(report.fDetails);
   fMembers["plugInDirectory"] = PlugInDirectory();
   fMembers["plugIns"] = PlugInsAsJson(report.fPlugIns);
-  AddInstances(report.fPlugIns);
+  fMembers["instances"] = nullptr;
 }
 
-// Also adds the namespaces that failed while they were read.
-void TReportDocument::AddInstances(std::vector<TPlugIn> const& plugIns) {
-  constexpr std::size_t usualSize = std::size_t(1) << 20;
-  fMembers["instances"] = nullptr;
-  fInstances.reserve(usualSize);  // growing, it would copy itself into new pages many times
-  TJson failures = TJson::array();
-  for (TNamespaceView const& view : ViewsOf(plugIns)) {
-    TInstanceJson json(view);
-    std::string const failure = FailureOf([&] {
-      for (auto const& instance : view.AllInstances()) {
-        TJson element = json.Of(*instance);
-        AppendElement(fInstances, fMessages == EMessages::kVerbatim ? AsVerbatimText(element) : AsText(std::move(element)));
-      }
-    });
-    if (!failure.empty()) failures.push_back({{"provider", view.GetProviderName()}, {"error", failure}});
-  }
-  if (!failures.empty()) fMembers["instanceFailures"] = failures;
+void TReportDocument::Write(TWriter const& write) const {
+  std::string const text = TextOf(fMembers);
+  std::size_t const line = text.find(kLineOfInstances);
+  if (line == text.npos) return write(text);
+  std::size_t const begin = line + std::strlen(kLineOfInstances);
+  write(text.substr(0, begin) + "[");
+  TJson members = fMembers;
+  TJson const failures = WriteInstances(write);
+  if (!failures.empty()) members["instanceFailures"] = failures;
+  write("]" + TextOf(members).substr(begin + std::strlen("null")));
 }
 
 std::string TReportDocument::Text() const {
-  std::string text = fMessages == EMessages::kVerbatim ? AsVerbatimText(fMembers) : AsText(fMembers);
-  std::size_t const line = text.find(kLineOfInstances);
-  if (line == text.npos) return text;
-  std::size_t const begin = line + std::strlen(kLineOfInstances);
-  std::string const rest = text.substr(begin + std::strlen("null"));
-  text.resize(begin);
-  text.reserve(begin + fInstances.size() + rest.size() + 8);
-  return text.append("[").append(fInstances).append(fInstances.empty() ? "]" : "\n  ]").append(rest);
+  std::string text;
+  Write([&text](std::string const& piece) { text += piece; });
+  return text;
+}
+
+std::string TReportDocument::TextOf(TJson json) const {
+  return fMessages == EMessages::kVerbatim ? AsVerbatimText(json) : AsText(std::move(json));
+}
+
+// Writes the elements of the array, and returns the namespaces that failed while they were read.
+TJson TReportDocument::WriteInstances(TWriter const& write) const {
+  constexpr std::size_t pieceSize = 65536;
+  TJson failures = TJson::array();
+  std::string piece;
+  bool isFirst = true;
+  for (TNamespaceView const& view : ViewsOf(*fPlugIns)) {
+    TInstanceJson json(view);
+    std::vector<boost::shared_ptr<ICIMInstance>> instances;
+    std::string failure = FailureOf([&] { instances = view.AllInstances(); });
+    for (auto instance = instances.begin(); instance != instances.end() && failure.empty(); ++instance) {
+      std::string element;
+      failure = FailureOf([&] { element = TextOf(json.Of(**instance)); });
+      if (!failure.empty()) break;
+      if (!std::exchange(isFirst, false)) piece += ',';
+      AppendElement(piece, element);
+      if (piece.size() >= pieceSize) write(std::exchange(piece, std::string()));
+    }
+    if (!failure.empty()) failures.push_back({{"provider", view.GetProviderName()}, {"error", failure}});
+  }
+  write(isFirst ? piece : piece + "\n  ");
+  return failures;
 }
 
 }  // namespace NQRVZEP20::zep

@@ -4,6 +4,7 @@
 #include "collect/Report.h"
 #include "tools/zep/output/Json.h"
 
+#include <functional>
 #include <string>
 #include <utility>
 #include <vector>
@@ -15,9 +16,13 @@ enum class EMessages { kWithoutSecrets, kVerbatim };
 
 // A report as a document, with every instance of every namespace. Its exit status reflects the completeness of the report.
 //
-// The instances, which are most of it, are kept as text: as a tree they would take ten times the memory, and most of the time.
+// The instances, which are most of it, are converted one by one while the document is written: the memory that they take does not
+// depend on their number.
 class TReportDocument {
 public:
+  using TWriter = std::function<void(std::string const& text)>;
+
+  // `report` is read while the document is written.
   TReportDocument(TReport const& report, EMessages messages);
 
   // A document without instances, about a report that was written elsewhere.
@@ -26,15 +31,18 @@ public:
   // All members; in place of the instances, null. They may be changed and added to.
   TJson& Members() { return fMembers; }
 
-  // The whole document, in the form of AsText.
+  // Calls `write` with one piece of the text after the other; the text has the form of AsText. What `write` throws is passed on.
+  void Write(TWriter const& write) const;
+
   std::string Text() const;
 
 private:
-  void AddInstances(std::vector<TPlugIn> const& plugIns);
+  std::string TextOf(TJson json) const;
+  TJson WriteInstances(TWriter const& write) const;
 
   EMessages fMessages = EMessages::kWithoutSecrets;
   TJson fMembers;
-  std::string fInstances;  // the elements of the array, separated by commas
+  std::vector<TPlugIn> const* fPlugIns = nullptr;
 };
 
 }  // namespace NQRVZEP20::zep

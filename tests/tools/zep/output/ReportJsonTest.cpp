@@ -1,0 +1,58 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/zep/output/ReportJson.h"
+
+#include "tests/collect/SamplePlugIns.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <stdexcept>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+TReport SampleReport() { return MakeReport(SamplePlugIns(), TheSample()); }
+
+TEST(ReportJsonTest, IsWrittenInPieces) {
+  TReport const report = SampleReport();
+  TReportDocument const document(report, EMessages::kWithoutSecrets);
+  std::vector<std::string> pieces;
+  document.Write([&pieces](std::string const& piece) { pieces.push_back(piece); });
+  EXPECT_GT(pieces.size(), 3u);
+  std::string whole;
+  for (std::string const& piece : pieces) whole += piece;
+  EXPECT_EQ(whole, document.Text());
+
+  TJson const json = TJson::parse(whole);
+  std::size_t count = 0;
+  for (TNamespaceView const& view : ViewsOf(report.fPlugIns)) count += view.AllInstances().size();
+  EXPECT_EQ(json["instances"].size(), count);
+  EXPECT_EQ(whole, AsText(json)) << "the form differs from that of other documents";
+}
+
+TEST(ReportJsonTest, AMemberThatWasAddedIsWritten) {
+  TReport const report = SampleReport();
+  TReportDocument document(report, EMessages::kVerbatim);
+  document.Members()["sent"] = "yes";
+  EXPECT_EQ(TJson::parse(document.Text())["sent"], "yes");
+}
+
+TEST(ReportJsonTest, AReportWithoutInstancesHasAnEmptyArray) {
+  TReport const report = MakeReport({}, TheSample());
+  TReportDocument const document(report, EMessages::kWithoutSecrets);
+  EXPECT_THAT(document.Text(), testing::HasSubstr("\"instances\": []"));
+}
+
+TEST(ReportJsonTest, AFailureOfTheOutputIsNotTakenForOneOfANamespace) {
+  TReport const report = SampleReport();
+  TReportDocument const document(report, EMessages::kWithoutSecrets);
+  int pieces = 0;
+  auto const write = [&pieces](std::string const&) {
+    if (++pieces == 2) throw std::runtime_error("the disk is full");
+  };
+  EXPECT_THROW(document.Write(write), std::runtime_error);
+  EXPECT_EQ(pieces, 2);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep
