@@ -248,8 +248,8 @@ TEST_F(InventoryTest, AControllerThatFallsSilentLeavesWhatWasRead) {
   settings.fPort = 6230;
   settings.fFru = FruImage();
   settings.fMore = SourcePath("tests/system/ipmi/sim/sensors.emu");
-  TSimulator behind(settings);
-  behind.WaitUntilReady();
+  TSimulator controller(settings);
+  controller.WaitUntilReady();
   constexpr int answers = 50;  // then the network loses everything
   TRelay relay(623, 6230,
                [](TRelay::TDatagram& datagram) { return datagram.fPlace < answers ? TRelay::AtOnce() : TRelay::TFate(); });
