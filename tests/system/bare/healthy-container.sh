@@ -17,11 +17,18 @@ mkdir "$work/bin"
 cp "$build/bin/zep" "$work/bin/"
 cp -r "$build/lib" "$work/"
 
-# The container has an empty /dev but for what every container has. zep ends with 2 if the machine has no serial number.
+# The libraries that the plug-ins need and zep does not: the tree has those of zep.
+libraries_of() { ldd "$@" | awk '/=> \//{print $3}' | sort -u; }
+libraries_of "$build/bin/zep" > "$work/of-zep"
+libraries_of "$build"/lib/*.nsp.so | comm -13 "$work/of-zep" - | xargs cp -t "$work/lib"
+
+# The container has only null in /dev. zep ends with 2 if the machine has no serial number.
 cat > "$work/ask" <<'END'
 set -eu
-mount -t tmpfs tmpfs /dev
-mknod -m 666 /dev/null c 1 3
+mount -t tmpfs tmpfs /mnt
+touch /mnt/null
+mount --bind /dev/null /mnt/null
+mount --move /mnt /dev
 LD_LIBRARY_PATH=/share/lib /share/bin/zep report --json > /share/container.json || [ $? = 2 ]
 END
 status=0
@@ -35,7 +42,12 @@ import json
 import sys
 
 def problems(path):
-    return {f"{each['rule']}: {each['reason']}" for each in json.load(open(path))["findings"]["problems"]}
+    document = json.load(open(path))
+    for plugin in document["plugIns"]:
+        errors = [plugin["error"]] + [provider["error"] for provider in plugin["providers"]]
+        if any(errors):
+            sys.exit(f"{path}: {plugin['name']} failed: {errors}")
+    return {each["rule"] for each in document["findings"]["problems"]}
 
 container, machine = (problems(path) for path in sys.argv[1:])
 print(f"{len(container)} findings in the container, {len(machine)} outside")
