@@ -5,6 +5,7 @@
 #include <cstdio>
 #include <map>
 #include <optional>
+#include <set>
 
 namespace NQRVZEP20 {
 
@@ -37,21 +38,32 @@ std::map<std::string, std::string> BridgesOf(TRuleRun const& run) {
   return bridges;
 }
 
-// Display controllers lower the rate of their link while they are idle.
-std::map<std::string, bool> DisplayControllers(TRuleRun const& run) {
+// The address of a device: that of its functions without their number.
+std::string DeviceOf(std::string const& function) { return function.substr(0, function.rfind('.')); }
+
+// The devices with a display controller, and the bridges above them, such as the switch of a graphics card. They lower the rate
+// of their links while they are idle.
+std::set<std::string> DevicesOfDisplays(TRuleRun const& run, std::map<std::string, std::string> const& bridges) {
   constexpr std::uint64_t display = 3;
-  std::map<std::string, bool> isDisplay;
-  for (TElement const& device : run.TryElements("CIM_PCIDevice")) {
-    auto const code = device.Number("ClassCode");
-    isDisplay[*device.Text("DeviceID").fValue] = code.IsKnown() && *code.fValue == display;
+  std::set<std::string> devices;
+  for (TElement const& function : run.TryElements("CIM_PCIDevice")) {
+    auto const code = function.Number("ClassCode");
+    if (!code.IsKnown() || *code.fValue != display) continue;
+    std::string const address = *function.Text("DeviceID").fValue;
+    devices.insert(DeviceOf(address));
+    auto bridge = bridges.find(address);
+    while (bridge != bridges.end() && devices.insert(DeviceOf(bridge->second)).second) bridge = bridges.find(bridge->second);
   }
-  return isDisplay;
+  return devices;
 }
+
+// The functions of a device share its link, which is judged once, with the first function.
+bool IsFirstFunction(std::string const& address) { return address.substr(DeviceOf(address).size()) == ".0"; }
 
 void AskPciLink(TRuleRun& run) {
   auto const links = run.Elements("ZEP_PCIExpressLink");
   auto const bridges = BridgesOf(run);
-  auto isDisplay = DisplayControllers(run);
+  auto const displays = DevicesOfDisplays(run, bridges);
   std::map<std::string, TLinkEnd> ends;
   for (TElement const& link : links) ends[*link.Text("DeviceID").fValue] = LinkEndOf(link);
 
@@ -59,6 +71,7 @@ void AskPciLink(TRuleRun& run) {
     std::string const address = *link.Text("DeviceID").fValue;
     auto const bridge = bridges.find(address);
     if (bridge == bridges.end() || ends.count(bridge->second) == 0) continue;  // an end of no link, or its upper end
+    if (!IsFirstFunction(address)) continue;
     TLinkEnd const &lower = ends[address], &upper = ends[bridge->second];
     if (!lower.fWidth || *lower.fWidth == 0 || !lower.fMaxWidth || !upper.fMaxWidth) continue;
     run.Know(link, link.Number("Width"));
@@ -68,7 +81,7 @@ void AskPciLink(TRuleRun& run) {
       run.Add(link, link.Number("Width").fSource, ESeverity::kWarning,
               name + " has " + std::to_string(*lower.fWidth) + " of the " + std::to_string(lanes) + " lanes that both ends have",
               "Seat the card anew; check the riser and the settings of the slot in the firmware.");
-    if (!lower.fRate || !lower.fMaxRate || !upper.fMaxRate || isDisplay[address]) continue;
+    if (!lower.fRate || !lower.fMaxRate || !upper.fMaxRate || displays.count(DeviceOf(address)) != 0) continue;
     double const rate = std::min(*lower.fMaxRate, *upper.fMaxRate);
     if (*lower.fRate < rate)
       run.Add(link, link.Real("TransferRate").fSource, ESeverity::kWarning,

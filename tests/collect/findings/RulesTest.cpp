@@ -203,6 +203,23 @@ TEST(RulesTest, ALinkIsComparedWithBothEnds) {
   EXPECT_THAT(Problems(rule, Link("Width = 4;", network)), IsEmpty());
 }
 
+TEST(RulesTest, TheFunctionsOfADeviceShareOneLink) {
+  std::string const slow = "Width = 8; MaxWidth = 8; TransferRate = 2.5; MaxTransferRate = 32.0;";
+  std::string const second = R"(instance of ZEP_PCIExpressLink { DeviceID = "01:00.1"; )" + slow + R"( };
+                                instance of CIM_ControlledBy { Antecedent = $bridge; Dependent = $second; };)";
+  std::string const sound = R"(instance of CIM_PCIDevice as $second { DeviceID = "01:00.1"; ClassCode = 4; };)" + second;
+  EXPECT_THAT(Problems("pci-link", Link(slow, "3") + sound), IsEmpty()) << "the sound of a display controller";
+  EXPECT_THAT(Problems("pci-link", Link(slow, "2") + sound), testing::SizeIs(1)) << "one finding for both functions";
+}
+
+TEST(RulesTest, TheSwitchOfAGraphicsCardMayBeSlow) {
+  std::string const slow = "Width = 8; MaxWidth = 8; TransferRate = 2.5; MaxTransferRate = 32.0;";
+  std::string const card = R"(instance of CIM_PCIDevice as $card { DeviceID = "02:00.0"; ClassCode = 3; };
+                              instance of CIM_ControlledBy { Antecedent = $device; Dependent = $card; };)";
+  EXPECT_THAT(Problems("pci-link", Link(slow, "6") + card), IsEmpty());
+  EXPECT_THAT(Problems("pci-link", Link(slow, "6")), testing::SizeIs(1));
+}
+
 // ---- Sensors ----
 
 std::string Sensor(int type, std::string const& state, int reading = 1) {
