@@ -19,7 +19,7 @@ TFinding<std::uint64_t> RecordsOf(TKernelLog const& log) {
                   "the log has more than the " + std::to_string(log.fRecords + log.fUnreadable) + " records that are read"};
 }
 
-// Without a known start the schema wants this text.
+// The schema prescribes this time if the start is unknown.
 TCIMDateTime TimeOf(TKernelMessage const& message, TRunningClock const& clock) {
   auto const time = clock.fBootSeconds.Then([&](std::uint64_t boot) {
     return DateTimeFrom(boot + message.fMicroseconds / kMicro, static_cast<unsigned>(message.fMicroseconds % kMicro));

@@ -7,10 +7,11 @@ namespace {
 
 std::string const kClass = "/sys/class/power_supply/";
 
-// Devices outside of the machine, such as a mouse, report their own supplies, with the scope "Device".
+// Mains and UPS. A USB port is one only while a charger is plugged in, and an empty one is no fault. Devices outside of the
+// machine, such as a mouse, report their own supplies, with the scope "Device".
 bool SuppliesTheMachine(TMachineFiles const& files, std::string const& directory) {
   auto const type = files.Line(directory + "type"), scope = files.Line(directory + "scope");
-  return type && *type != "Battery" && !(scope && *scope == "Device");
+  return type && (*type == "Mains" || *type == "UPS") && !(scope && *scope == "Device");
 }
 
 }  // namespace

@@ -9,7 +9,7 @@
 
 namespace NQRVZEP20 {
 
-// A power supply that the kernel lists in /sys/class/power_supply; batteries are not among them.
+// A power supply of the type Mains or UPS in /sys/class/power_supply. Batteries and USB ports are left out.
 struct TPowerSupply {
   std::string fName = {};                      // "ACAD"
   TFinding<bool> fIsOnline = TMissing{};       // whether it gets and gives power

@@ -49,6 +49,9 @@ public:
 
   TFinding<std::int32_t> Reading() const {
     auto const reading = Number("_input");
+    if (reading && IsOfNoThermistor(*reading))
+      return TMissing{kMissingPlaceholder,
+                      Path("_input") + " contains " + std::to_string(*reading) + ", as if nothing is connected"};
     return reading || fKind.fKind != EKind::kPower ? reading : Number("_average");  // some meters have only an average
   }
 
@@ -69,6 +72,11 @@ public:
   }
 
 private:
+  // The ends of the range of eight bits, in millidegrees.
+  bool IsOfNoThermistor(std::int32_t reading) const {
+    return fKind.fKind == EKind::kTemperature && (reading == 127000 || reading == -128000);
+  }
+
   std::string Path(char const* ending) const { return fDirectory + fName + ending; }
   bool Has(char const* ending) const { return fNames.count(fName + ending) != 0; }
   TMissing None(char const* ending) const { return {kMissingNotGiven, Path(ending) + " does not exist"}; }
@@ -88,6 +96,9 @@ private:
 TSensor SensorOf(TSensorFiles const& sensor, std::string const& chip, std::string const& path, std::string const& name,
                  TKindOfFile const& kind) {
   bool const isPower = kind.fKind == EKind::kPower;  // "power1_cap" is the limit that the chip itself keeps
+  auto lower = sensor.Threshold("_min"), upper = sensor.Threshold(isPower ? "_cap" : "_max");
+  if (lower && upper && *lower >= *upper)  // some chips begin with the same value in both
+    lower = upper = TMissing{kMissingPlaceholder, path + "_min is not below the upper threshold: neither is set"};
   return {chip,
           name,
           path,
@@ -95,8 +106,8 @@ TSensor SensorOf(TSensorFiles const& sensor, std::string const& chip, std::strin
           sensor.Label(),
           sensor.Reading(),
           sensor.Threshold("_lcrit"),
-          sensor.Threshold("_min"),
-          sensor.Threshold(isPower ? "_cap" : "_max"),
+          lower,
+          upper,
           sensor.Threshold("_crit"),
           sensor.Threshold("_emergency"),
           sensor.IsFaulty()};

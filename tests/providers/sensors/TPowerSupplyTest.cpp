@@ -36,12 +36,20 @@ TEST_F(TPowerSupplyTest, ASupplyHasStateAndMaker) {
   EXPECT_FALSE(supplies[0].fSerialNumber);
 }
 
-TEST_F(TPowerSupplyTest, BatteriesAndOtherDevicesAreNoSupplies) {
+TEST_F(TPowerSupplyTest, BatteriesUsbPortsAndOtherDevicesAreNoSupplies) {
   Write("BAT0", "type", "Battery");
-  Write("mouse", "type", "USB");
+  Write("ucsi-source-psy-1", "type", "USB");
+  Write("ucsi-source-psy-1", "scope", "System");
+  Write("ucsi-source-psy-1", "online", "0");
+  Write("mouse", "type", "Mains");
   Write("mouse", "scope", "Device");
   Write("unknown", "online", "1");
   EXPECT_TRUE(Read().empty());
+}
+
+TEST_F(TPowerSupplyTest, AnUninterruptibleSupplyIsOne) {
+  Write("ups", "type", "UPS");
+  EXPECT_EQ(Read().size(), 1u);
 }
 
 }  // namespace

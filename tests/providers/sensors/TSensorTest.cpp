@@ -88,6 +88,31 @@ TEST_F(TSensorTest, AThresholdOfZeroOrBeyondAllMeasureIsNotSet) {
   EXPECT_EQ(*StateOf(sensor), "Normal");
 }
 
+TEST_F(TSensorTest, AThermistorThatIsNotConnectedHasNoReading) {
+  Chip("hwmon0", "board");
+  Write("hwmon0", "temp1_input", "-128000");
+  Write("hwmon0", "temp2_input", "127000");
+  Write("hwmon0", "in1_input", "127000");
+  auto const sensors = Sensors();
+  ASSERT_EQ(sensors.size(), 3u);
+  for (TSensor const& sensor : sensors)
+    if (sensor.fKind == TSensor::EKind::kTemperature)
+      EXPECT_EQ(sensor.fReading.Why().fCode, kMissingPlaceholder) << sensor.fName;
+    else
+      EXPECT_EQ(*sensor.fReading, 127000);
+}
+
+TEST_F(TSensorTest, EqualLowerAndUpperThresholdsAreNotSet) {
+  Chip("hwmon0", "board");
+  Write("hwmon0", "temp1_input", "35000");
+  Write("hwmon0", "temp1_min", "127000");
+  Write("hwmon0", "temp1_max", "127000");
+  TSensor const sensor = Only();
+  EXPECT_EQ(sensor.fLowerNonCritical.Why().fCode, kMissingPlaceholder);
+  EXPECT_EQ(sensor.fUpperNonCritical.Why().fCode, kMissingPlaceholder);
+  EXPECT_EQ(*StateOf(sensor), "Normal");
+}
+
 TEST_F(TSensorTest, TheWorstStateIsNamed) {
   TSensor sensor;
   auto const stateAt = [&](int reading) {
