@@ -29,14 +29,18 @@ std::string NameToJudge(TElement const& system) {
   return root.IsKnown() && type.IsKnown() && !HasNoSpace(*type.fValue) ? "the file system on " + *root.fValue : "";
 }
 
+bool IsReadOnly(TElement const& system) {
+  auto const isReadOnly = system.Flag("ReadOnly");
+  return isReadOnly.IsKnown() && *isReadOnly.fValue;
+}
+
 void AskFullFileSystem(TRuleRun& run) {
   constexpr std::uint64_t gibibyte = 1ull << 30, almostNone = 1;
   for (TElement const& system : run.Elements("CIM_LocalFileSystem")) {
     std::string const name = NameToJudge(system);
     auto const size = system.Number("FileSystemSize"), free = system.Number("AvailableSpace");
     if (name.empty() || !run.Know(system, size) || !run.Know(system, free) || *size.fValue == 0) continue;
-    auto const isReadOnly = system.Flag("ReadOnly");
-    if (isReadOnly.IsKnown() && *isReadOnly.fValue) continue;
+    if (IsReadOnly(system)) continue;
     std::uint64_t const percent = PercentOf(*free.fValue, *size.fValue);
     if (percent >= run.Thresholds().fFileSystemFreePercent ||
         *free.fValue >= run.Thresholds().fFileSystemFreeGibibytes * gibibyte)
@@ -49,6 +53,7 @@ void AskFullFileSystem(TRuleRun& run) {
 
 void AskInodes(TRuleRun& run) {
   for (TElement const& system : run.Elements("CIM_UnixLocalFileSystem")) {
+    if (IsReadOnly(system)) continue;
     std::string const name = NameToJudge(system);
     auto const all = system.Number("TotalInodes"), free = system.Number("FreeInodes");
     if (name.empty() || !run.Know(system, all) || !run.Know(system, free)) continue;

@@ -40,6 +40,9 @@ void AskFans(TRuleRun& run) {
     if (hasStopped || *state.fValue == "Fault")
       run.Add(sensor, state.fSource, ESeverity::kError, "the fan " + sensor.Label() + " has stopped or is broken",
               "Replace the fan.");
+    else if (Contains(*state.fValue, "Lower") && !Contains(*state.fValue, "Non-Critical"))
+      run.Add(sensor, state.fSource, ESeverity::kError, "the fan " + sensor.Label() + " is too slow (" + *state.fValue + ")",
+              "Clean the fan, or replace it.");
   }
 }
 
@@ -62,7 +65,7 @@ void AskPowerSupplies(TRuleRun& run) {
               "Replace the power supply.");
     else if (code == stopped && hasPower)
       run.Add(supply, status.fSource, ESeverity::kError, "the power supply " + supply.Label() + " has no power",
-              "Check its cable and the circuit that it is connected to; replace it if they are well.");
+              "Check its cable and the circuit that it is connected to; if both work, replace the power supply.");
   }
 }
 

@@ -99,7 +99,7 @@ void AskDegradedArray(TRuleRun& run) {
     bool const isRebuilding = action.IsKnown() && (*action.fValue == "recover" || *action.fValue == "resync");
     if (state == "inactive" || state == "clear")
       run.Add(array, missing.fSource, ESeverity::kCritical, name + " does not run: " + lacks,
-              "Connect the missing disks, then start the array (mdadm --assemble).");
+              "Connect the missing disks, then start the array (mdadm --run).");
     else if (isRebuilding)
       run.Add(array, missing.fSource, ESeverity::kWarning, name + " is being rebuilt: " + lacks,
               "Wait until it is complete; until then a further failure may lose the data.");

@@ -103,6 +103,7 @@ TEST(RulesTest, AFileSystemWithoutInodesIsNamed) {
               ElementsAre("warning: the file system on /data has nearly no room for further files: 4 % of its inodes free"));
   EXPECT_THAT(Problems(rule, FileSystem("ext4", "9", "9", "TotalInodes = 1000; FreeInodes = 50;")), IsEmpty());
   EXPECT_THAT(Problems(rule, FileSystem("btrfs", "9", "9", "TotalInodes = 0; FreeInodes = 0;")), IsEmpty());
+  EXPECT_THAT(Problems(rule, FileSystem("ext4", "9", "9", "ReadOnly = true; TotalInodes = 1000; FreeInodes = 0;")), IsEmpty());
 }
 
 std::string Mount(std::string const& type, std::string const& options, std::string const& ofSystem) {
@@ -247,6 +248,7 @@ TEST(RulesTest, AFanThatDoesNotTurnAlthoughItShouldIsNamed) {
   EXPECT_THAT(Problems(rule, Sensor(kFan, "Fault", 900)), ElementsAre(reason));
   EXPECT_THAT(Problems(rule, Sensor(kFan, "Normal", 0)), IsEmpty()) << "it has no lowest speed: it may stand still";
   EXPECT_THAT(Problems(rule, Sensor(kFan, "Lower Non-Critical", 200)), IsEmpty());
+  EXPECT_THAT(Problems(rule, Sensor(kFan, "Lower Critical", 200)), ElementsAre("error: the fan S1 is too slow (Lower Critical)"));
 }
 
 std::string Supply(char const* name, char const* status) {

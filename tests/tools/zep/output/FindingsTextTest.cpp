@@ -71,9 +71,13 @@ TEST_F(FindingsTextTest, AHealthyMachineHasNone) {
   nlohmann::json const document = JsonOf(Report("server", {"--json"}));
   EXPECT_THAT(ProblemsOf(document), IsEmpty());
   EXPECT_TRUE(document["findings"]["worst"].is_null());
+  std::map<std::string, int> examined;
+  for (nlohmann::json const& rule : document["findings"]["rules"]) examined[rule["id"]] = rule["examined"];
+  for (char const* rule : {"disk-lost", "array-degraded", "file-system-full", "port-errors", "pci-link"})
+    EXPECT_GT(examined[rule], 0) << rule << " has judged nothing";
 }
 
-TEST_F(FindingsTextTest, TablesOfManyFirmwaresGiveNone) {
+TEST_F(FindingsTextTest, TablesOfVirtualFirmwareGiveNone) {
   for (std::string const& table : kRealTables) {
     TTempDir const root;
     fs::create_directories(root.Path("sys/firmware/dmi"));
@@ -96,6 +100,17 @@ TEST_F(FindingsTextTest, AProcessKilledForLackOfMemoryIsFound) {
   nlohmann::json const& killed = document["findings"]["problems"][0];
   EXPECT_EQ(killed["reason"], "the kernel killed the process tail because no memory was left, 2 hours ago");
   EXPECT_EQ(killed["source"], "/dev/kmsg");
+}
+
+TEST_F(FindingsTextTest, AMachineCheckAndADamagedFileSystemAreFound) {
+  TTempDir const root;
+  fs::create_directories(root.Path("dev"));
+  fs::create_directories(root.Path("proc"));
+  fs::copy(TestDataPath("kmsg/machine-check-and-file-system"), root.Path("dev/kmsg"));
+  WriteFile(root.Path("proc/uptime"), "7230.00 1.0\n");
+  nlohmann::json const document = JsonOf(fInstalled->Run({{"report", "--json"}, {{"ZEP_ROOT", root.Path()}}}));
+  EXPECT_THAT(ProblemsOf(document),
+              AllOf(testing::Contains(HasSubstr("hardware-errors")), testing::Contains(HasSubstr("disk-errors"))));
 }
 
 TEST_F(FindingsTextTest, BondsWithOneMemberAreFound) {
