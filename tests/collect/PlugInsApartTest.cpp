@@ -5,6 +5,7 @@
 #include "tests/Support.h"
 #include "tests/collect/SamplePlugIns.h"
 #include "tests/collect/answer/DumpOf.h"
+#include "tests/collect/answer/RandomNamespace.h"
 
 #include <fcntl.h>
 #include <gmock/gmock.h>
@@ -15,6 +16,7 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <cstring>
 #include <memory>
 #include <thread>
 
@@ -49,6 +51,17 @@ TEST(PlugInsApartTest, TheAnswersAreThoseOfThePlugInsInThisProcess) {
       EXPECT_EQ(DumpOf(*one.Get()), DumpOf(*other.Get()));
       EXPECT_GT(apart[n].fProviders[m].fMilliseconds, 0);
     }
+  }
+}
+
+TEST(PlugInsApartTest, RandomNamespacesAnswerAsInThisProcess) {
+  auto const plugIns = LoadPlugInsApart({TPlugInFile{"Random", RANDOM_PROVIDERS}});
+  ASSERT_EQ(plugIns.size(), 1u);
+  ASSERT_EQ(plugIns[0].fProviders.size(), kRandomProviders);
+  for (TProviderRun const& provider : plugIns[0].fProviders) {
+    ASSERT_TRUE(provider.fView) << provider.fError;
+    auto const seed = static_cast<unsigned int>(std::stoul(provider.fName.substr(std::strlen("Random"))));
+    EXPECT_EQ(DumpOf(*provider.fView->Get()), DumpOf(*RandomNamespace(seed))) << seed;
   }
 }
 
