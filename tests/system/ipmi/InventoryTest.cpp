@@ -142,7 +142,7 @@ TEST_F(InventoryTest, EventsAgreeWithIpmitool) {
   Ipmitool("raw 0x0a 0x44 0 0 2 0 0 0 0 0x20 0 4 8 0x51 0x6f 1 0xff 0xff");
   json const document = Inventory();
   auto const rows = RowsOf(Ipmitool("sel elist"), '|');
-  ASSERT_EQ(rows.size(), 5U);
+  ASSERT_EQ(rows.size(), 6U);
   for (TCells const& row : rows) {
     SCOPED_TRACE(row.at(0));
     json const& entry = Instance(document, "ZEP_EventLogEntry", "RecordID", std::to_string(std::stoi(row.at(0), nullptr, 16)));
@@ -209,13 +209,16 @@ TEST_F(InventoryTest, FindingsAndTablesArePrinted) {
   zep::TRun const run = Run({"127.0.0.1", "--inventory"});
   EXPECT_EQ(run.fStatus, 0);
   EXPECT_EQ(run.fErrors, "");
-  for (char const* text :
-       {"Serial number    KQ12345\n", "the sensor CPU Temp is beyond a threshold (Upper Critical).", "failure of PSU 1",
-        "the clock of the management controller is not set.", "4500 RPM", "12 Volts", "Server Q100", "zepadmin"})
+  for (char const* text : {"Serial number    KQ12345\n", "the sensor CPU Temp is beyond a threshold (Upper Critical).",
+                           "failure of PSU 1", "the clock of the management controller is not set.", "4500 RPM", "12 Volts",
+                           "+12V: Upper Critical - going high,", "Server Q100", "zepadmin"})
     EXPECT_THAT(run.fOutput, HasSubstr(text));
   EXPECT_THAT(run.fOutput, Not(HasSubstr("zeppass1")));
-  Ipmitool("sel time set now");
-  EXPECT_THAT(Run({"127.0.0.1", "--inventory"}).fOutput, Not(HasSubstr("clock of the management controller")));
+  Ipmitool("raw 0x0a 0x49 0x80 0x44 0x17 0x60");  // Set SEL Time: 1 February 2021
+  Ipmitool("raw 0x0a 0x44 0 0 2 0 0 0 0 0x20 0 4 8 0x51 0x6f 1 0xff 0xff");
+  std::string const dated = Run({"127.0.0.1", "--inventory"}).fOutput;
+  EXPECT_THAT(dated, Not(HasSubstr("clock of the management controller")));
+  EXPECT_THAT(dated, HasSubstr("2021-02-01 00:00:"));
 }
 
 TEST_F(InventoryTest, TheSensorRecordsAreReadFromTheCacheTheSecondTime) {

@@ -12,6 +12,7 @@
 
 #include <cmath>
 #include <cstdio>
+#include <string_view>
 
 namespace NQRVZEP20::zep {
 
@@ -83,12 +84,15 @@ std::string ReadingText(TNamespaceView const& view, ICIMInstance const& sensor, 
 }
 
 TCell CellOf(TNamespaceView const& view, ICIMInstance const& instance, char const* property) {
-  if (property == kReading && instance.GetClass(TCIMContext())->GetName(TCIMContext()) == "CIM_Sensor")
+  bool const isReading = property == std::string_view(kReading);
+  if (isReading && instance.GetClass(TCIMContext())->GetName(TCIMContext()) == "CIM_Sensor")
     return TCell::Unknown({kMissingNotApplicable, "the sensor has states, and no number"}, "");
   auto const answer = view.Answer(instance, property);
   if (!answer.IsKnown()) return TCell::Unknown(answer.fMissing, answer.fSource);
-  if (property == kReading) return TCell::Known(ReadingText(view, instance, *answer.fValue), answer.fSource);
-  return TCell::Known(TimeText(WordOf(instance, property, *answer.fValue)), answer.fSource);
+  if (isReading) return TCell::Known(ReadingText(view, instance, *answer.fValue), answer.fSource);
+  std::string const word = WordOf(instance, property, *answer.fValue);
+  bool const isTime = answer.fValue->GetType() == TCIMValue::TCIMType::kCIMTypeDateTime;
+  return TCell::Known(isTime ? TimeText(word) : word, answer.fSource);
 }
 
 TReportSection SectionOf(TNamespaceView const& view, TSubject const& subject) {
