@@ -111,7 +111,7 @@ void QueryController(std::string const& host, TAccount const& account, TInventor
   add("model", TOSSpecific::GetRemoteMachineModel(host, account.fUser, password));
   add("serial number", TOSSpecific::GetRemoteMSN(host, account.fUser, password));
   send(WhyNotAll(fields) + kEnd);
-  if (inventory != nullptr) SendInventory(host, *inventory, send);
+  if (inventory != nullptr) SendInventory(host, inventory->After(TClock::now() - start), send);
   IIPMILan::GetInstance()->IpmilanCloseConnect();
 }
 

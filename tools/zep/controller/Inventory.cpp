@@ -63,6 +63,11 @@ std::string WhyNotAll(TNamespaceView const& view) {
 
 }  // namespace
 
+TInventoryLimits TInventoryLimits::After(std::chrono::steady_clock::duration passed) const {
+  std::chrono::seconds const left = std::chrono::seconds(fSeconds) - std::chrono::ceil<std::chrono::seconds>(passed);
+  return {static_cast<unsigned>(std::max(left, std::chrono::seconds(1)).count()), fShowsProgress};
+}
+
 void SendInventory(std::string const& host, TInventoryLimits const& limits, TSend const& send) {
   boost::shared_ptr<ICIMNamespace> ns;
   std::string const failure = FailureOf([&] { ns = ReadController(host, limits); });

@@ -5,12 +5,13 @@
 #include "tools/zep/output/Json.h"
 #include "tools/zep/processes/TChildProcess.h"
 
+#include <chrono>
 #include <memory>
 #include <string>
 
 namespace NQRVZEP20::zep {
 
-// What the provider Controller (libController.nsp.so) found in a remote controller.
+// The namespace that the provider Controller (libController.nsp.so) filled from a remote controller.
 struct TInventory {
   std::shared_ptr<TNamespaceView const> fView;  // null without an inventory
   std::string fWhyNotAll;                       // why there is none, or which lists are incomplete; empty if nothing is missing
@@ -18,6 +19,9 @@ struct TInventory {
 
 // How an inventory is read.
 struct TInventoryLimits {
+  // The limits after a part of the time is over; at least a second remains.
+  TInventoryLimits After(std::chrono::steady_clock::duration passed) const;
+
   unsigned fSeconds;    // after which no further command is sent
   bool fShowsProgress;  // on standard error, which must be a terminal
 };

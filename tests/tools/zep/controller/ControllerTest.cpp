@@ -28,6 +28,17 @@ std::string WithoutHead(TJson document) {
   return document.dump();
 }
 
+TEST(InventoryLimitsTest, TheTimeOfTheSessionIsSubtracted) {
+  using namespace std::chrono_literals;
+  TInventoryLimits const limits = {90, true};
+  EXPECT_EQ(limits.After(0s).fSeconds, 90U);
+  EXPECT_EQ(limits.After(30s).fSeconds, 60U);
+  EXPECT_EQ(limits.After(30001ms).fSeconds, 59U);
+  EXPECT_EQ(limits.After(89s).fSeconds, 1U);
+  EXPECT_EQ(limits.After(200s).fSeconds, 1U);
+  EXPECT_TRUE(limits.After(30s).fShowsProgress);
+}
+
 TEST(RemoteIdentityTextTest, IsReadFromTheTextThatTheProcessSent) {
   TRemoteIdentity const whole = IdentityFrom("h", kSaid, true);
   EXPECT_TRUE(IsComplete(whole));
