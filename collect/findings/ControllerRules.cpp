@@ -54,7 +54,7 @@ void AskEvents(TRuleRun& run) {
     std::string const often = events.fCount > 1 ? ", the last of " + std::to_string(events.fCount) : "";
     run.Add(events.fNewest, events.fSource, ESeverity::kError,
             "the controller's event log has a critical entry: " + text + " (" + AgeText(events.fAge) + often + ")",
-            "Check the part that the entry names; clear the event log when it is mended (ipmitool sel clear).");
+            "Check the part that the entry names; clear the event log when the part is repaired (ipmitool sel clear).");
   }
 }
 
@@ -64,7 +64,8 @@ void AskLogFull(TRuleRun& run) {
     auto const hasLost = log.Flag("HasLostRecords");
     bool const isFull = run.Know(log, free) && *free.fValue == 0;
     if (isFull || (run.Know(log, hasLost) && *hasLost.fValue))
-      run.Add(log, free.fSource, ESeverity::kWarning, "the controller's event log is full, so that new events are lost",
+      run.Add(log, isFull ? free.fSource : hasLost.fSource, ESeverity::kWarning,
+              "the controller's event log is full, so that new events are lost",
               "Save the event log, and clear it (ipmitool sel list, ipmitool sel clear).");
   }
 }
@@ -94,7 +95,9 @@ void AskAccounts(TRuleRun& run) {
     auto const privilege = account.Text("Privilege"), name = account.Text("UserID");
     if (!run.Know(account, state) || *state.fValue != enabled) continue;
     if (!hasAccess.IsKnown() || !*hasAccess.fValue || !privilege.IsKnown()) continue;
-    if (!name.IsKnown())
+    if (!name.IsKnown() && name.fMissing.fCode != kMissingNotGiven)
+      run.Know(account, name);
+    else if (!name.IsKnown())
       run.Add(account, state.fSource, ESeverity::kWarning,
               "the management controller has an enabled account without a name (" + *privilege.fValue + ")",
               "Disable it (ipmitool user disable), because a login needs no user name.");
@@ -130,7 +133,7 @@ bool IsOfSensors(TRule const& rule) { return rule.fId == "sensor-threshold" || r
 
 }  // namespace
 
-std::vector<TRule> EventLogRules() {
+std::vector<TRule> ManagementControllerRules() {
   return {{"controller-part-failed", "Does the management controller report a failed part?", AskStates},
           {"event-log-critical", "Does the controller's event log have a critical entry?", AskEvents},
           {"event-log-full", "Is the controller's event log full?", AskLogFull},
@@ -142,7 +145,7 @@ std::vector<TRule> ControllerRules() {
   std::vector<TRule> rules;
   for (TRule& rule : SensorRules())
     if (IsOfSensors(rule)) rules.push_back(std::move(rule));
-  for (TRule& rule : EventLogRules()) rules.push_back(std::move(rule));
+  for (TRule& rule : ManagementControllerRules()) rules.push_back(std::move(rule));
   return rules;
 }
 

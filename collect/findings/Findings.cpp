@@ -45,8 +45,8 @@ std::string NameOf(TRuleResult::EOutcome outcome) {
 
 std::vector<TRule> StandardRules() {
   std::vector<TRule> rules;
-  for (auto const part : {StorageRules, FileSystemRules, NetworkRules, DeviceRules, SensorRules, LogRules, EventLogRules,
-                          HostRules, SystemRules, PlugInRules})
+  for (auto const part : {StorageRules, FileSystemRules, NetworkRules, DeviceRules, SensorRules, LogRules,
+                          ManagementControllerRules, HostRules, SystemRules, PlugInRules})
     for (TRule& rule : part()) rules.push_back(std::move(rule));
   return rules;
 }

@@ -14,7 +14,7 @@ std::vector<TRule> NetworkRules();
 std::vector<TRule> DeviceRules();
 std::vector<TRule> SensorRules();
 std::vector<TRule> LogRules();
-std::vector<TRule> EventLogRules();
+std::vector<TRule> ManagementControllerRules();
 std::vector<TRule> HostRules();
 std::vector<TRule> SystemRules();
 

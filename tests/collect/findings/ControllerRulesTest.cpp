@@ -40,6 +40,13 @@ TEST(ControllerRulesTest, ACriticalEntryIsNamedWithItsAge) {
   EXPECT_THAT(Problems(rule, OnController(Entry(1, event, kCritical, 31 * kDay)), thresholds), testing::SizeIs(1));
 }
 
+// The reason why a value is missing. `path`: of its instance, with escaped quotation marks.
+std::string Missing(std::string const& path, std::string const& property, std::string const& code) {
+  return "class ZEP_MissingValue { string ElementPath; string ElementProperty; string Code; string Reason; };"
+         "instance of ZEP_MissingValue { ElementPath = \"" +
+         path + "\"; ElementProperty = \"" + property + "\"; Code = \"" + code + "\"; Reason = \"a reason\"; };";
+}
+
 std::string Log(std::string const& state) {
   return OnController("instance of ZEP_EventLog { InstanceID = \"l\"; " + state + " };");
 }
@@ -51,13 +58,21 @@ TEST(ControllerRulesTest, AFullLogIsNamed) {
   EXPECT_THAT(Problems("event-log-full", Log("FreeRecords = 9; HasLostRecords = false;")), IsEmpty());
 }
 
+TEST(ControllerRulesTest, AFullLogIsNamedWithTheSourceThatShowsIt) {
+  auto const sourceOf = [](std::string const& state) {
+    auto const problems = FindingsOf(Log("ClockTime = \"20210201000000.000000+000\"; " + state)).fProblems;
+    return problems.size() == 1 ? problems[0].fSource : std::to_string(problems.size()) + " problems";
+  };
+  EXPECT_EQ(sourceOf("FreeRecords = 0; HasLostRecords = true;"), "free");
+  EXPECT_EQ(sourceOf("FreeRecords = 9; HasLostRecords = true;"), "lost");
+  EXPECT_EQ(sourceOf("HasLostRecords = true;"), "lost");
+}
+
 TEST(ControllerRulesTest, AClockThatIsNotSetIsNamed) {
-  std::string const missing =
-      R"(class ZEP_MissingValue { string ElementPath; string ElementProperty; string Code; string Reason; };
-    instance of ZEP_MissingValue { ElementPath = "ZEP_EventLog.InstanceID=\"l\""; ElementProperty = "ClockTime"; Code = ")";
-  EXPECT_THAT(Problems("controller-clock", Log("") + missing + "placeholder\"; Reason = \"not set\"; };"),
+  auto const missing = [](char const* code) { return Missing("ZEP_EventLog.InstanceID=\\\"l\\\"", "ClockTime", code); };
+  EXPECT_THAT(Problems("controller-clock", Log("") + missing("placeholder")),
               ElementsAre("warning: the clock of the management controller is not set"));
-  EXPECT_THAT(Problems("controller-clock", Log("") + missing + "no-answer\"; Reason = \"silence\"; };"), IsEmpty());
+  EXPECT_THAT(Problems("controller-clock", Log("") + missing("no-answer")), IsEmpty());
   EXPECT_THAT(Problems("controller-clock", Log("ClockTime = \"20210201000000.000000+000\";")), IsEmpty());
 }
 
@@ -78,6 +93,19 @@ TEST(ControllerRulesTest, AccountsThatAnyoneKnowsAreNamed) {
   EXPECT_THAT(Problems(rule, Account("\"ADMIN\"", enabled, "User")), IsEmpty());
   EXPECT_THAT(Problems(rule, Account("NULL", enabled, "User", false)), IsEmpty()) << "without access over the LAN";
   EXPECT_THAT(Problems(rule, Account("\"alice\"", enabled, "Administrator")), IsEmpty());
+}
+
+TEST(ControllerRulesTest, AnAccountWhoseNameWasNotReadIsNotNameless) {
+  constexpr int enabled = 2;
+  auto const missing = [](char const* code) { return Missing("ZEP_ControllerAccount.Name=\\\"2\\\"", "UserID", code); };
+  std::string const rule = "controller-account", account = Account("NULL", enabled, "User");
+  EXPECT_THAT(Problems(rule, account + missing("not-given")), testing::SizeIs(1));
+  for (char const* const code : {"no-answer", "refused", "time-is-up"}) {
+    EXPECT_THAT(Problems(rule, account + missing(code)), IsEmpty()) << code;
+    auto const notAsked = ResultOf(rule, FindingsOf(account + missing(code))).fNotAsked;
+    ASSERT_EQ(notAsked.size(), 1U) << code;
+    EXPECT_EQ(notAsked[0].fReason, "a reason") << code;
+  }
 }
 
 std::string Sensor(std::string const& type, int status) {

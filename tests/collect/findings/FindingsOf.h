@@ -18,6 +18,7 @@ namespace NQRVZEP20 {
 inline constexpr char const* kRuleClasses = R"(
   Qualifier Description : string, Scope(any);
   Qualifier ValueMap : string[], Scope(property);
+  Qualifier ValueSource : string, Scope(property);
   class CIM_ManagedElement {};
   Qualifier Key : boolean = false, Scope(property, reference), Flavor(DisableOverride);
   Qualifier Association : boolean = false, Scope(association), Flavor(DisableOverride);
@@ -47,7 +48,8 @@ inline constexpr char const* kRuleClasses = R"(
   class CIM_NumericSensor : CIM_Sensor { sint32 CurrentReading; sint32 UnitModifier; };
   class ZEP_ManagementController { [key] string DeviceID; };
   class ZEP_ControllerAccount { [key] string Name; string UserID; uint16 EnabledState; string Privilege; boolean HasLANAccess; };
-  class ZEP_EventLog { [key] string InstanceID; uint64 FreeRecords; boolean HasLostRecords; datetime ClockTime; };
+  class ZEP_EventLog { [key] string InstanceID; [ValueSource("free")] uint64 FreeRecords;
+    [ValueSource("lost")] boolean HasLostRecords; datetime ClockTime; };
   class ZEP_EventLogEntry { [key] string RecordID; string RecordData; uint16 PerceivedSeverity; uint64 Age; boolean HasEnded; };
   class ZEP_MemoryErrors { [key] string InstanceID; string ElementName; uint64 CorrectedErrors; uint64 UncorrectedErrors; };
   class ZEP_PCIErrors { [key] string InstanceID; string ElementName; uint64 CorrectableErrors; uint64 NonFatalErrors;
