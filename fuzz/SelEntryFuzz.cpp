@@ -15,7 +15,8 @@ extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size
   sensor.fScale = {0, 0, 1, 0, 0, 0};
   Require(!EventText(*entry, &sensor).empty() && !EventText(*entry, nullptr).empty());
   EEventSeverity const severity = SeverityOf(*entry);
-  Require(!entry->fIsDeasserted || severity == EEventSeverity::kInformation || entry->fKind != TSelEntry::EKind::kEvent);
+  Require(!entry->fIsDeasserted || severity == EEventSeverity::kInformation);
+  Require(!entry->fIsDeasserted || entry->fKind == TSelEntry::EKind::kEvent);
   SelTimeFrom(entry->fTime);
   return 0;
 }

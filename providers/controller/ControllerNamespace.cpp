@@ -64,7 +64,7 @@ void WritePackages(TRecordWriter& writer, TController const& controller) {
   writer.Write(PackageRecord({}, {}), records, whyNone);
 }
 
-// What an event and the later end of its state have in common.
+// Common to an event and the later end of its state.
 auto StateOf(TSelEntry const& entry) {
   return std::make_tuple(entry.fOwner, entry.fSensorType, entry.fSensorNumber, entry.fEventType, entry.fData[0] & 0x0F);
 }
@@ -93,8 +93,9 @@ std::vector<TLoggedEvent> EventsOf(TEventLog const& log, std::vector<TSensorStat
   std::set<decltype(StateOf(TSelEntry()))> ended;
   std::set<std::uint16_t> seen;
   std::for_each(log.fEntries.rbegin(), log.fEntries.rend(), [&](TSelEntry const& entry) {
-    if (entry.fIsDeasserted) ended.insert(StateOf(entry));
-    bool const hasEnded = ended.count(StateOf(entry)) > 0;
+    bool const isEvent = entry.fKind == TSelEntry::EKind::kEvent;
+    if (isEvent && entry.fIsDeasserted) ended.insert(StateOf(entry));
+    bool const hasEnded = isEvent && ended.count(StateOf(entry)) > 0;
     if (seen.insert(entry.fId).second) events.push_back({entry, SensorOf(entry, sensors), AgeOf(entry, log.fClock), hasEnded});
   });
   std::reverse(events.begin(), events.end());

@@ -39,7 +39,7 @@ std::vector<std::string> UnreadPartsOf(TController const& controller) {
   return parts;
 }
 
-// What all sensors have, in this order.
+// The properties of all sensors, in this order.
 TRecord SensorRecord(char const* className, TSensorState const& state, TComputerSystem const& system) {
   TSdrSensor const& sensor = state.fSensor;
   TRecord record(className, "IPMI sensor data records");
@@ -87,6 +87,11 @@ TFinding<TCIMDateTime> TimeOf(TSelEntry const& entry) {
   return TCIMDateTime(time.fSeconds / day, static_cast<unsigned short>(time.fSeconds % day / hour),
                       static_cast<unsigned short>(time.fSeconds % hour / minute),
                       static_cast<unsigned short>(time.fSeconds % minute), 0);
+}
+
+TFinding<std::string> SensorTypeNameOf(TSelEntry const& entry) {
+  if (entry.fKind == TSelEntry::EKind::kEvent) return SensorTypeName(entry.fSensorType);
+  return TMissing{kMissingNotApplicable, "the entry is in a form of the maker"};
 }
 
 std::string EventLabelOf(TLoggedEvent const& event) {
@@ -206,7 +211,7 @@ TRecord EntryRecord(TLoggedEvent const& event) {
   record.Add("ElementName", Known(label));
   record.Add("PerceivedSeverity", Known(static_cast<std::uint16_t>(SeverityOf(event.fEntry)))).Names(kPerceivedSeverityNames);
   record.Add("RecordData", Known(label + ": " + EventText(event.fEntry, event.fSensor)));
-  record.Add("SensorTypeName", Known(SensorTypeName(event.fEntry.fSensorType)));
+  record.Add("SensorTypeName", SensorTypeNameOf(event.fEntry));
   record.Add("Age", event.fAge).Unit("second");
   record.Add("HasEnded", Known(event.fHasEnded));
   return record;

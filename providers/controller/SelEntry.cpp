@@ -25,13 +25,14 @@ std::optional<TSelEntry> SelEntryFrom(std::string_view bytes) {
   entry.fRecordType = record.At(2);
   entry.fKind = KindOf(entry.fRecordType);
   entry.fTime = entry.fKind == TSelEntry::EKind::kMakerWithoutTime ? kUnknownTime : record.Long(3);
+  entry.fBytes = bytes.substr(0, kSelEntryLength);
+  if (entry.fKind != TSelEntry::EKind::kEvent) return entry;
   entry.fOwner = record.At(7);
   entry.fSensorType = record.At(10);
   entry.fSensorNumber = record.At(11);
   entry.fEventType = record.At(12) & 0x7F;
   entry.fIsDeasserted = (record.At(12) & 0x80) != 0;
   for (std::size_t i = 0; i < 3; ++i) entry.fData[i] = record.At(13 + i);
-  entry.fBytes = bytes.substr(0, kSelEntryLength);
   return entry;
 }
 

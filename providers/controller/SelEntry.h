@@ -20,7 +20,7 @@ struct TSelEntry {
   std::uint8_t fRecordType = 0;
   std::uint32_t fTime = 0;  // as the controller reports it; see SelTimeFrom
 
-  // Of an event:
+  // Only of an event:
   std::uint8_t fOwner = 0, fSensorType = 0, fSensorNumber = 0, fEventType = 0;
   bool fIsDeasserted = false;  // the state has ended
   std::uint8_t fData[3] = {};

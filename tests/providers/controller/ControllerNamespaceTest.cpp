@@ -97,6 +97,24 @@ TEST_F(ControllerNamespaceTest, EveryPartHasItsInstances) {
   EXPECT_THAT(text, Not(HasSubstr("ElementName: again"))) << "the second record of one sensor";
 }
 
+TEST_F(ControllerNamespaceTest, AnEntryInAFormOfTheMakerDoesNotEndAState) {
+  std::string const event = SelEvent(0, 1, 0x30, 1, 0x59, 91, 90);
+  std::string makers = SelEvent(1, 1, 0x30, 0x81, 0x59, 91, 90);  // at the same places as in the end of the event
+  makers[2] = '\xC0';
+  fController.fEvents = {event, makers};
+  std::string const text = Fill();
+  EXPECT_THAT(text, Not(HasSubstr("HasEnded: true")));
+  std::size_t const record = text.find("  ElementName: maker's entry\n");
+  ASSERT_NE(record, std::string::npos);
+  EXPECT_EQ(text.substr(record, text.find("CIM_SystemDevice", record) - record),
+            "  ElementName: maker's entry\n"
+            "  PerceivedSeverity: 0\n"
+            "  RecordData: maker's entry: entry in a form of the maker: 01 00 c0 80 44 17 60 20 00 04 01 30 81 59 5b 5a\n"
+            "  SensorTypeName: <the entry is in a form of the maker>\n"
+            "  Age: 0\n"
+            "  HasEnded: false\n");
+}
+
 TEST_F(ControllerNamespaceTest, AControllerThatFallsSilentLeavesReasons) {
   fController.fMostRequests = 38;  // up to the event log
   std::string const text = Fill();
