@@ -68,7 +68,6 @@ TFinding<std::uint64_t> TimeFrom(TBytes const& area) {
 }
 
 void ReadChassis(TFruArea& area, std::string_view bytes) {
-  area.fChassisType = TBytes(bytes).At(2);
   TFields fields(bytes, 3, true);
   for (TText* field : {&area.fPartNumber, &area.fSerialNumber}) *field = fields.Next();
   ReadCustom(area, fields);
@@ -96,7 +95,6 @@ TFruArea AreaWith(EKind kind, TMissing const& why) {
   for (TText* field :
        {&area.fManufacturer, &area.fName, &area.fPartNumber, &area.fVersion, &area.fSerialNumber, &area.fAssetTag, &area.fFileId})
     *field = why;
-  area.fChassisType = why;
   area.fManufactureTime = why;
   return area;
 }

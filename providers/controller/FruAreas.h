@@ -17,7 +17,6 @@ struct TFruArea {
   using TText = TFinding<std::string>;
 
   EKind fKind = EKind::kChassis;
-  TFinding<std::uint8_t> fChassisType = TMissing{};       // as in SMBIOS
   TFinding<std::uint64_t> fManufactureTime = TMissing{};  // of a board, in seconds since 1970
   TText fManufacturer = TMissing{}, fName = TMissing{}, fPartNumber = TMissing{}, fVersion = TMissing{},
         fSerialNumber = TMissing{}, fAssetTag = TMissing{}, fFileId = TMissing{};

@@ -51,8 +51,6 @@ TSdrSensor SensorOf(TBytes const& record, TSdrSensor::EKind kind) {
   sensor.fOwner = record.At(5);
   sensor.fLun = record.At(6) & 0x03;
   sensor.fNumber = record.At(7);
-  sensor.fEntity = record.At(8);
-  sensor.fEntityInstance = record.At(9) & 0x7F;
   std::size_t const types = kind == TSdrSensor::EKind::kEventOnly ? 10 : 12;
   sensor.fType = record.At(types);
   sensor.fReadingType = record.At(types + 1) & 0x7F;
@@ -62,7 +60,6 @@ TSdrSensor SensorOf(TBytes const& record, TSdrSensor::EKind kind) {
 TSdrSensor FullSensor(TBytes const& record) {
   TSdrSensor sensor = SensorOf(record, TSdrSensor::EKind::kFull);
   sensor.fIsPercentage = (record.At(20) & 1) != 0;
-  sensor.fRateUnit = record.At(20) >> 3 & 0x07;
   sensor.fUnit = record.At(21);
   sensor.fScale = ScaleOf(record);
   if (sensor.fReadingType == kThresholdReading) sensor.fThresholds = ThresholdsOf(record);

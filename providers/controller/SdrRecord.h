@@ -35,10 +35,9 @@ struct TSdrSensor {
 
   EKind fKind = EKind::kFull;
   std::uint8_t fOwner = 0x20, fLun = 0, fNumber = 0;  // of the controller that has the sensor
-  std::uint8_t fEntity = 0, fEntityInstance = 0;
   std::uint8_t fType = 0, fReadingType = 0;
   bool fIsPercentage = false;
-  std::uint8_t fUnit = 0, fRateUnit = 0;
+  std::uint8_t fUnit = 0;
   TSensorScale fScale = {};
   TRawThresholds fThresholds = {};  // as the repository has them
   TFinding<std::string> fName = TMissing{};
@@ -51,7 +50,7 @@ struct TFruLocator {
   TFinding<std::string> fName = TMissing{};
 };
 
-// What a record describes; neither of the two for a record of another kind, and for one that is cut short.
+// The content of a record; neither of the two for a record of another kind, and for one that is cut short.
 struct TSdrRecord {
   std::optional<TSdrSensor> fSensor;
   std::optional<TFruLocator> fFru;

@@ -133,7 +133,7 @@ TFinding<TSdrRepository> ReadSdrRepository(TIpmi const& ipmi, ISdrCache const* c
   if (!HasTimes(bytes)) cache = nullptr;
   if (cache != nullptr) {
     auto const records = cache->Load(StateOf(*info));
-    if (records) return TSdrRepository{*records, true};
+    if (records) return TSdrRepository{*records};
   }
   TSdrRepository const repository = ReadRecords(ipmi, bytes.Word(1), progress);
   if (cache != nullptr && repository.fIsComplete) cache->Save(StateOf(*info), repository.fRecords);

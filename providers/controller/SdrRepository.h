@@ -16,7 +16,6 @@ using TProgress = std::function<void(char const* step, std::size_t done, std::si
 // The sensor data records of a controller, each with its header.
 struct TSdrRepository {
   std::vector<std::string> fRecords;
-  bool fIsFromCache = false;
   TFinding<bool> fIsComplete = true;  // otherwise why the records after these were not read
 };
 

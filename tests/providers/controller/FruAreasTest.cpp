@@ -17,7 +17,6 @@ TEST(FruAreasTest, EachAreaHasItsFields) {
   ASSERT_EQ(areas->size(), 3U);
   TFruArea const &chassis = (*areas)[0], &board = (*areas)[1], &product = (*areas)[2];
   EXPECT_EQ(chassis.fKind, EKind::kChassis);
-  EXPECT_EQ(*chassis.fChassisType, 0x17);
   EXPECT_EQ(*chassis.fPartNumber, "PN-1");
   EXPECT_EQ(*chassis.fSerialNumber, "CH123");
   EXPECT_THAT(chassis.fCustom, ElementsAre("rail kit"));
