@@ -37,7 +37,7 @@ using TIpmiResponse = std::array<unsigned char, kIpmiClientResponseSize + 1>;
 
 TIpmiResult SendIpmiCommand(TIpmiCommand const& command, TIpmiResponse& response);
 
-// What the controller answered: the completion code and the data after it.
+// The answer of the controller: the completion code and the data after it.
 struct TIpmiAnswer {
   bool fIsAnswered = false;  // false if the command could not be sent, or was not answered
   unsigned char fCompletionCode = 0xFF;

@@ -148,7 +148,7 @@ TFinding<std::vector<TUserAccount>> ReadUsers(TIpmi const& ipmi, TFinding<std::v
 TSensorState ReadSensor(TIpmi const& ipmi, TSdrSensor const& sensor) {
   TSensorState state{sensor, TMissing{}, TMissing{}, sensor.fThresholds};
   if (sensor.fOwner != kThisController || sensor.fLun != 0) {
-    TMissing const why{kMissingNotGiven, "the sensor belongs to another controller, which is not queried"};
+    TMissing const why{kMissingNotGiven, "the sensor belongs to another controller or another LUN, which is not queried"};
     state.fRaw = why;
     state.fStates = why;
     return state;

@@ -26,7 +26,7 @@ TIpmi Connection() {
   return Recorded(files.IsThisMachine() ? WithinTime(LocalConnection(), kLocalLimit) : TIpmi(), files);
 }
 
-// While answers are recorded, and when they are read from a recording, the records are read from the controller itself.
+// No cache while answers are recorded or read from a recording, because a recording has all of them.
 std::unique_ptr<ISdrCache> MakeCache(std::string const& identity) {
   bool const isRecorded = !TMachineFiles::OfThisProcess().IsThisMachine() || std::getenv("ZEP_RECORD_ANSWERS") != nullptr;
   if (gRemote == nullptr && isRecorded) return nullptr;

@@ -8,8 +8,8 @@
 namespace NQRVZEP20 {
 
 // A file below the user's cache directory ($XDG_CACHE_HOME, or ~/.cache) with the sensor data records of one controller. Only its
-// owner can read it. It is replaced as a whole, so that several processes can use it. Anything that is wrong with the
-// file or its directory means that there is no cache.
+// owner can read it. It is replaced as a whole, so that several processes can use it. A file that is damaged, or not
+// owned by the user, is ignored.
 class TSdrCacheFile : public ISdrCache {
 public:
   // `name`: of the server. `identity`: what distinguishes its controller from one that replaces it.
