@@ -69,16 +69,21 @@ auto StateOf(TSelEntry const& entry) {
   return std::make_tuple(entry.fOwner, entry.fSensorType, entry.fSensorNumber, entry.fEventType, entry.fData[0] & 0x0F);
 }
 
-TSdrSensor const* SensorOf(TSelEntry const& entry, std::vector<TSensorState> const& sensors) {
-  auto const found = std::find_if(sensors.begin(), sensors.end(), [&](TSensorState const& state) {
-    return state.fSensor.fOwner == entry.fOwner && state.fSensor.fNumber == entry.fSensorNumber;
-  });
-  bool const isEvent = entry.fKind == TSelEntry::EKind::kEvent;
-  return isEvent && found != sensors.end() ? &found->fSensor : nullptr;
+TSdrSensor const* SensorOf(TSelEntry const& entry, TController const& controller) {
+  if (entry.fKind != TSelEntry::EKind::kEvent) return nullptr;
+  auto const isMeant = [&](TSdrSensor const& sensor) {
+    return sensor.fOwner == entry.fOwner && sensor.fNumber == entry.fSensorNumber;
+  };
+  for (TSensorState const& state : controller.fSensors)
+    if (isMeant(state.fSensor)) return &state.fSensor;
+  for (TSdrSensor const& sensor : controller.fEventSensors)
+    if (isMeant(sensor)) return &sensor;
+  return nullptr;
 }
 
 TFinding<std::uint64_t> AgeOf(TSelEntry const& entry, TFinding<std::uint64_t> const& clock) {
   TSelTime const time = SelTimeFrom(entry.fTime);
+  if (time.fKind == TSelTime::EKind::kUnknown) return TMissing{kMissingNotGiven, "the entry has no time"};
   if (time.fKind != TSelTime::EKind::kDate)
     return TMissing{kMissingNotGiven, "the entry has no date: the clock of the controller was not set"};
   return clock.Then([&](std::uint64_t now) -> TFinding<std::uint64_t> {
@@ -88,7 +93,7 @@ TFinding<std::uint64_t> AgeOf(TSelEntry const& entry, TFinding<std::uint64_t> co
 }
 
 // From the newest to the oldest, so that the ends of states come first.
-std::vector<TLoggedEvent> EventsOf(TEventLog const& log, std::vector<TSensorState> const& sensors) {
+std::vector<TLoggedEvent> EventsOf(TEventLog const& log, TController const& controller) {
   std::vector<TLoggedEvent> events;
   std::set<decltype(StateOf(TSelEntry()))> ended;
   std::set<std::uint16_t> seen;
@@ -96,7 +101,7 @@ std::vector<TLoggedEvent> EventsOf(TEventLog const& log, std::vector<TSensorStat
     bool const isEvent = entry.fKind == TSelEntry::EKind::kEvent;
     if (isEvent && entry.fIsDeasserted) ended.insert(StateOf(entry));
     bool const hasEnded = isEvent && ended.count(StateOf(entry)) > 0;
-    if (seen.insert(entry.fId).second) events.push_back({entry, SensorOf(entry, sensors), AgeOf(entry, log.fClock), hasEnded});
+    if (seen.insert(entry.fId).second) events.push_back({entry, SensorOf(entry, controller), AgeOf(entry, log.fClock), hasEnded});
   });
   std::reverse(events.begin(), events.end());
   return events;
@@ -107,7 +112,7 @@ void WriteLog(TRecordWriter& writer, TController const& controller) {
   TRecords logs, entries;
   if (log) {
     logs.push_back(LogRecord(*log));
-    for (TLoggedEvent const& event : EventsOf(*log, controller.fSensors)) entries.push_back(EntryRecord(event));
+    for (TLoggedEvent const& event : EventsOf(*log, controller)) entries.push_back(EntryRecord(event));
   }
   TFinding<bool> const isComplete = log.Then([](TEventLog const& known) { return known.fIsComplete; });
   writer.Write(LogRecord({}), logs, WhyNone(log, ""));

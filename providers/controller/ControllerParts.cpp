@@ -10,12 +10,11 @@ namespace NQRVZEP20 {
 
 namespace {
 
-constexpr std::uint8_t kApplication = 0x06, kGetChannelInfo = 0x42, kGetUserAccess = 0x44, kGetUserName = 0x46;
-constexpr std::uint8_t kTransport = 0x0C, kGetLanParameter = 0x02;
-constexpr std::uint8_t kSensorEvent = 0x04, kGetReading = 0x2D, kGetThresholds = 0x27;
-constexpr std::uint8_t kStorage = 0x0A, kGetFruInfo = 0x10, kReadFru = 0x11;
+constexpr std::uint8_t kGetChannelInfo = 0x42, kGetUserAccess = 0x44, kGetUserName = 0x46;  // kApplication
+constexpr std::uint8_t kGetLanParameter = 0x02;                                             // kTransport
+constexpr std::uint8_t kGetReading = 0x2D, kGetThresholds = 0x27;                           // kSensorEvent
+constexpr std::uint8_t kGetFruInfo = 0x10, kReadFru = 0x11;                                 // kStorage
 constexpr std::uint8_t kLanMedium = 4, kThisController = 0x20, kLastChannel = 11;
-constexpr std::uint8_t kThresholdReading = 1;
 constexpr std::size_t kFruPart = 0x20;
 
 char Char(std::size_t byte) { return static_cast<char>(byte); }
@@ -96,12 +95,23 @@ TUserAccount UserFrom(std::string const& access, std::uint8_t user, std::uint8_t
 
 // ---- FRU ----
 
+TIpmiRequest FruRequest(std::uint8_t device, std::size_t offset, std::size_t length) {
+  return {kStorage, kReadFru, {Char(device), Char(offset & 0xFF), Char(offset >> 8), Char(length)}};
+}
+
+// In shorter parts if the controller refuses longer ones.
 TFinding<std::string> FruContent(TIpmi const& ipmi, std::uint8_t device, std::size_t size) {
   std::string content;
+  std::size_t longest = kFruPart;
   while (content.size() < std::min(size, LengthOfAreas(content))) {
-    std::size_t const length = std::min(kFruPart, std::min(size, LengthOfAreas(content)) - content.size());
-    auto const part =
-        Ask(ipmi, {kStorage, kReadFru, {Char(device), Char(content.size() & 0xFF), Char(content.size() >> 8), Char(length)}}, 2);
+    std::size_t const length = std::min(longest, std::min(size, LengthOfAreas(content)) - content.size());
+    TIpmiRequest const request = FruRequest(device, content.size(), length);
+    auto const answer = ipmi(request);
+    if (RefusesLength(answer) && length > kShortestPart) {
+      longest = std::max(length / 2, kShortestPart);
+      continue;
+    }
+    auto const part = DataOf(answer, request, 2);
     if (!part) return part;
     content += part->substr(1, length);
   }
@@ -119,11 +129,16 @@ TFinding<std::string> GuidFrom(std::string const& bytes) {
 
 TFinding<std::vector<TLanChannel>> ReadLanChannels(TIpmi const& ipmi) {
   std::vector<TLanChannel> lans;
+  std::vector<TMissing> refusals;  // of channels that do not exist
   for (std::uint8_t channel = 1; channel <= kLastChannel; ++channel) {
     auto const info = Ask(ipmi, {kApplication, kGetChannelInfo, {Char(channel)}}, 2);
     if (!info && info.Why().fCode != kMissingRefused) return info.Why();
-    if (info && (TBytes(*info).At(1) & 0x7F) == kLanMedium) lans.push_back(ReadLan(ipmi, channel));
+    if (!info)
+      refusals.push_back(info.Why());
+    else if ((TBytes(*info).At(1) & 0x7F) == kLanMedium)
+      lans.push_back(ReadLan(ipmi, channel));
   }
+  if (refusals.size() == kLastChannel) return refusals.front();
   return lans;
 }
 
@@ -135,7 +150,7 @@ TFinding<std::vector<TUserAccount>> ReadUsers(TIpmi const& ipmi, TFinding<std::v
   std::uint8_t last = 1;
   for (std::uint8_t user = 1; user <= last; ++user) {
     auto const access = UserAccess(ipmi, channel, user);
-    if (!access && access.Why().fCode != kMissingRefused) return access.Why();
+    if (!access && (user == 1 || access.Why().fCode != kMissingRefused)) return access.Why();
     if (!access) continue;
     if (user == 1) last = TBytes(*access).At(0) & 0x3F;
     TUserAccount account = UserFrom(*access, user, channel);
@@ -161,7 +176,8 @@ TSensorState ReadSensor(TIpmi const& ipmi, TSdrSensor const& sensor) {
     return answer;
   });
   state.fRaw = reading.Then([](std::string const& answer) { return TBytes(answer).At(0); });
-  state.fStates = reading.Then([&](std::string const& answer) {
+  state.fStates = reading.Then([&](std::string const& answer) -> TFinding<std::uint16_t> {
+    if (answer.size() < 3) return TMissing{kMissingNotGiven, "the controller's answer has a reading, but no state"};
     std::uint16_t const mask = sensor.fReadingType == kThresholdReading ? 0x3F : 0x7FFF;
     return static_cast<std::uint16_t>(TBytes(answer).Word(2) & mask);
   });

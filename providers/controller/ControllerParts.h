@@ -13,7 +13,8 @@ TFinding<std::string> GuidFrom(std::string const& bytes);
 // The channels that are LANs. Missing if the controller answers no query about its channels.
 TFinding<std::vector<TLanChannel>> ReadLanChannels(TIpmi const& ipmi);
 
-// The accounts that have a name or are enabled, for the first LAN channel. Never their passwords: no command reads them.
+// The accounts that have a name or are enabled, for the first LAN channel. Missing if the controller does not describe the first
+// account, because its answer has the number of accounts. Never their passwords: no command reads them.
 TFinding<std::vector<TUserAccount>> ReadUsers(TIpmi const& ipmi, TFinding<std::vector<TLanChannel>> const& lans);
 
 TSensorState ReadSensor(TIpmi const& ipmi, TSdrSensor const& sensor);

@@ -82,7 +82,7 @@ TFinding<std::string> OtherTextsOf(TFruArea const& area) {
 TFinding<TCIMDateTime> TimeOf(TSelEntry const& entry) {
   TSelTime const time = SelTimeFrom(entry.fTime);
   constexpr std::uint32_t minute = 60, hour = 3600, day = 86400;
-  if (time.fKind == TSelTime::EKind::kUnknown) return TMissing{kMissingNotGiven, "the entry has no time"};
+  if (time.fKind == TSelTime::EKind::kUnknown) return UnknownTime();  // the reason is that of Age
   if (time.fKind == TSelTime::EKind::kDate) return PointInTime(time.fSeconds);
   return TCIMDateTime(time.fSeconds / day, static_cast<unsigned short>(time.fSeconds % day / hour),
                       static_cast<unsigned short>(time.fSeconds % hour / minute),

@@ -9,7 +9,7 @@ namespace NQRVZEP20 {
 
 namespace {
 
-constexpr std::uint8_t kStorage = 0x0A, kGetInfo = 0x40, kGetEntry = 0x43, kGetTime = 0x48;
+constexpr std::uint8_t kGetInfo = 0x40, kGetEntry = 0x43, kGetTime = 0x48;
 constexpr std::uint16_t kFirstEntry = 0x0000, kNoMoreEntries = 0xFFFF;
 constexpr std::size_t kInfoLength = 14, kMostEntries = 20000;
 constexpr std::uint16_t kUnknownRoom = 0xFFFF;  // "65535 or more"

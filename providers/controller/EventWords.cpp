@@ -14,7 +14,7 @@ namespace NQRVZEP20 {
 
 namespace {
 
-constexpr std::uint8_t kThresholdReading = 1, kSensorSpecific = 0x6F;
+constexpr std::uint8_t kSensorSpecific = 0x6F;
 
 // The text that a function of libfreeipmi writes into a buffer; empty if it has none.
 template <class TFunction>

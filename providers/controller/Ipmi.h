@@ -19,12 +19,24 @@ struct TIpmiRequest {
 // long as the connection does.
 using TIpmi = std::function<TFinding<std::string>(TIpmiRequest const& request)>;
 
-// Completion codes.
-constexpr std::uint8_t kReservationLost = 0xC5, kTooLong = 0xCA, kLengthRefused = 0xC8, kUnspecified = 0xFF;
+// Network functions.
+constexpr std::uint8_t kSensorEvent = 0x04, kApplication = 0x06, kStorage = 0x0A, kTransport = 0x0C;
 
-// The data of the answer, without the completion code. Missing if there was no answer, if the controller refused the command, or
-// if there are fewer than `leastLength` bytes.
+// Completion codes.
+constexpr std::uint8_t kReservationLost = 0xC5;
+
+// The data of an answer to the request, without the completion code. Missing if there was no answer, if the controller refused
+// the command, or if there are fewer than `leastLength` bytes.
+TFinding<std::string> DataOf(TFinding<std::string> const& answer, TIpmiRequest const& request, std::size_t leastLength = 0);
+
+// Sends the command and returns the data of its answer.
 TFinding<std::string> Ask(TIpmi const& ipmi, TIpmiRequest const& request, std::size_t leastLength = 0);
+
+// Commands that read a part of something return at most this many bytes: a controller that refuses a longer part must accept it.
+constexpr std::size_t kShortestPart = 8;
+
+// Whether the controller refused the command because of its length or the length of the answer, so that a shorter part may help.
+bool RefusesLength(TFinding<std::string> const& answer);
 
 // Codes of the reasons that Ask and connections give.
 constexpr char const* kMissingRefused = "refused";  // the controller refused the command

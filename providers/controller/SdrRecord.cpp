@@ -11,7 +11,6 @@ namespace {
 enum EType : std::uint8_t { kFull = 0x01, kCompact = 0x02, kEventOnly = 0x03, kFruDevice = 0x11 };
 
 constexpr std::size_t kHeader = 5;
-constexpr std::uint8_t kThresholdReading = 1;
 
 // A number of `bits` bits in two's complement.
 int Signed(unsigned value, unsigned bits) {
@@ -57,11 +56,16 @@ TSdrSensor SensorOf(TBytes const& record, TSdrSensor::EKind kind) {
   return sensor;
 }
 
+// Full records of sensors with states often have zeros instead of the mark for "no number".
+bool HasNumber(TSdrSensor const& sensor) {
+  return sensor.fReadingType == kThresholdReading || sensor.fIsPercentage || sensor.fUnit != 0;
+}
+
 TSdrSensor FullSensor(TBytes const& record) {
   TSdrSensor sensor = SensorOf(record, TSdrSensor::EKind::kFull);
   sensor.fIsPercentage = (record.At(20) & 1) != 0;
   sensor.fUnit = record.At(21);
-  sensor.fScale = ScaleOf(record);
+  if (HasNumber(sensor)) sensor.fScale = ScaleOf(record);
   if (sensor.fReadingType == kThresholdReading) sensor.fThresholds = ThresholdsOf(record);
   sensor.fName = NameAt(record, 47);
   return sensor;

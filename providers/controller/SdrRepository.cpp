@@ -10,10 +10,10 @@ namespace NQRVZEP20 {
 
 namespace {
 
-constexpr std::uint8_t kStorage = 0x0A, kGetInfo = 0x20, kReserve = 0x22, kGetRecord = 0x23;
+constexpr std::uint8_t kGetInfo = 0x20, kReserve = 0x22, kGetRecord = 0x23;
 constexpr std::uint16_t kFirstRecord = 0x0000, kNoMoreRecords = 0xFFFF;
 constexpr std::size_t kHeader = 5, kMostRecords = 4096, kInfoLength = 14;
-constexpr std::size_t kLongestPart = 64, kShortestPart = 8;
+constexpr std::size_t kLongestPart = 64;
 constexpr int kAttempts = 5;  // of a record whose reservation others cancel
 
 void AppendWord(std::string& data, std::uint16_t word) {
@@ -72,11 +72,8 @@ private:
     for (;;) {
       TIpmiRequest const request = RequestFor(id, offset, length);
       auto const answer = fIpmi(request);
-      if (!answer) return answer.Why();
-      std::uint8_t const code = TBytes(*answer).At(0);
-      if (code == kReservationLost) fIsReserved = false;
-      bool const isTooLong = code == kTooLong || code == kLengthRefused || code == kUnspecified;
-      if (!isTooLong || length <= kShortestPart) return DataOf(*answer, request, length, next);
+      if (answer && TBytes(*answer).At(0) == kReservationLost) fIsReserved = false;
+      if (!RefusesLength(answer) || length <= kShortestPart) return PartFrom(answer, request, length, next);
       length = fLongestPart = std::max(length / 2, kShortestPart);
     }
   }
@@ -89,9 +86,9 @@ private:
     return request;
   }
 
-  static TFinding<std::string> DataOf(std::string const& answer, TIpmiRequest const& request, std::size_t length,
-                                      std::uint16_t& next) {
-    auto const data = Ask([&](TIpmiRequest const&) { return answer; }, request, 2 + length);
+  static TFinding<std::string> PartFrom(TFinding<std::string> const& answer, TIpmiRequest const& request, std::size_t length,
+                                        std::uint16_t& next) {
+    auto const data = DataOf(answer, request, 2 + length);
     if (!data) return data;
     next = TBytes(*data).Word(0);
     return data->substr(2, length);

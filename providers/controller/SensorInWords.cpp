@@ -11,7 +11,6 @@ namespace NQRVZEP20 {
 
 namespace {
 
-constexpr std::uint8_t kThresholdReading = 1;
 constexpr std::uint16_t kUnknown = 0, kOther = 1, kOK = 2, kDegraded = 3, kStressed = 4, kError = 6;
 constexpr std::uint16_t kPercentage = 65;
 constexpr std::uint8_t kLastSharedUnit = 19;  // up to hertz, the schema has the units of IPMI in the same order

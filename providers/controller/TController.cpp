@@ -10,7 +10,7 @@ namespace NQRVZEP20 {
 
 namespace {
 
-constexpr std::uint8_t kApplication = 0x06, kGetDeviceId = 0x01, kGetGuid = 0x37;
+constexpr std::uint8_t kGetDeviceId = 0x01, kGetGuid = 0x37;
 constexpr std::uint8_t kThisController = 0x20;
 
 std::vector<TSdrRecord> ParsedRecords(std::vector<std::string> const& records) {
@@ -23,7 +23,11 @@ void ReadSensors(TController& controller, TIpmi const& ipmi, std::vector<TSdrRec
   std::size_t done = 0;
   for (TSdrRecord const& record : records) {
     ++done;
-    if (!record.fSensor || record.fSensor->fKind == TSdrSensor::EKind::kEventOnly) continue;
+    if (!record.fSensor) continue;
+    if (record.fSensor->fKind == TSdrSensor::EKind::kEventOnly) {
+      controller.fEventSensors.push_back(*record.fSensor);
+      continue;
+    }
     controller.fSensors.push_back(ReadSensor(ipmi, *record.fSensor));
     progress("sensors", done, records.size());
   }

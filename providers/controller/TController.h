@@ -62,6 +62,7 @@ struct TController {
   TFinding<std::vector<TUserAccount>> fUsers = TMissing{};
   TFinding<bool> fHasAllRecords = TMissing{};  // of sensor data; otherwise why some or all are missing
   std::vector<TSensorState> fSensors;
+  std::vector<TSdrSensor> fEventSensors;  // without a reading; only the event log names them
   std::vector<TFruDevice> fFrus;
   TFinding<TEventLog> fLog = TMissing{};
 };

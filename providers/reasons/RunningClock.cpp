@@ -46,6 +46,8 @@ TFinding<TCIMDateTime> DateTimeFrom(std::uint64_t secondsSince1970, unsigned mic
   }
 }
 
+TCIMDateTime UnknownTime() { return TCIMDateTime("99990101000000.000000+000"); }
+
 TRunningClock RunningClockOf(TMachineFiles const& files) {
   auto const boot = BootSeconds(files);
   auto const uptime = files.Line("/proc/uptime").Then([](std::string const& text) { return SecondsFrom(text, "/proc/uptime"); });

@@ -19,12 +19,11 @@ TFinding<std::uint64_t> RecordsOf(TKernelLog const& log) {
                   "the log has more than the " + std::to_string(log.fRecords + log.fUnreadable) + " records that are read"};
 }
 
-// The schema prescribes this time if the start is unknown.
 TCIMDateTime TimeOf(TKernelMessage const& message, TRunningClock const& clock) {
   auto const time = clock.fBootSeconds.Then([&](std::uint64_t boot) {
     return DateTimeFrom(boot + message.fMicroseconds / kMicro, static_cast<unsigned>(message.fMicroseconds % kMicro));
   });
-  return time ? *time : TCIMDateTime("99990101000000.000000+000");
+  return time ? *time : UnknownTime();
 }
 
 // The clock of the log stands still while the machine sleeps, so that an error may appear older than it is.

@@ -68,6 +68,11 @@ inline std::string CompactSensorRecord(int id, int number, int type, std::string
   return Bytes({id, 0, 0x51, 2, static_cast<int>(body.size())}) + body;
 }
 
+inline std::string EventOnlyRecord(int id, int number, int type, std::string const& name) {
+  std::string const body = Bytes({0x20, 0, number, 12, 1, type, 0x6F, 0, 0, 0, 0}) + TextField(name);
+  return Bytes({id, 0, 0x51, 3, static_cast<int>(body.size())}) + body;
+}
+
 inline std::string FruLocatorRecord(int id, int device, std::string const& name) {
   std::string const body = Bytes({0x20, device, 0x80, 0, 0, 0x10, 0, 7, 1, 0}) + TextField(name);
   return Bytes({id, 0, 0x51, 0x11, static_cast<int>(body.size())}) + body;

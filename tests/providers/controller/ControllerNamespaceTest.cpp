@@ -115,6 +115,23 @@ TEST_F(ControllerNamespaceTest, AnEntryInAFormOfTheMakerDoesNotEndAState) {
             "  HasEnded: false\n");
 }
 
+TEST_F(ControllerNamespaceTest, AnEventHasTheNameOfASensorThatOnlyReportsEvents) {
+  fController.fRecords.push_back(EventOnlyRecord(3, 0x77, 0x12, "System Event"));
+  fController.fEvents = {SelEvent(0, 0x12, 0x77, 0x6F, 1)};
+  std::string const text = Fill();
+  EXPECT_THAT(text, HasSubstr("  RecordData: System Event: OEM System Boot Event, asserted\n"));
+  EXPECT_THAT(text, Not(HasSubstr("  CurrentState: <")));
+}
+
+TEST_F(ControllerNamespaceTest, AnEntryWithoutATimeHasTheUnknownTimeAsItsKey) {
+  std::string makers = SelEvent(0, 1, 0x30, 1, 0x59);
+  makers[2] = '\xE0';  // a form without a time
+  fController.fEvents = {makers};
+  std::string const text = Fill();
+  EXPECT_THAT(text, HasSubstr("MessageTimestamp=\"99990101000000.000000+000\""));
+  EXPECT_THAT(text, HasSubstr("  Age: <the entry has no time>\n"));
+}
+
 TEST_F(ControllerNamespaceTest, AControllerThatFallsSilentLeavesReasons) {
   fController.fMostRequests = 38;  // up to the event log
   std::string const text = Fill();

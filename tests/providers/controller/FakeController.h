@@ -22,7 +22,8 @@ public:
   std::vector<std::string> fEvents;
   std::string fFru;                             // the content of FRU device 0
   std::map<std::string, std::string> fAnswers;  // to other requests, by network function, command and data
-  std::size_t fLongestPart = 255;               // of a record
+  std::size_t fLongestPart = 255;               // of a record or of the FRU device
+  int fTooLong = 0xCA;                          // the completion code for longer parts
   int fLostReservations = 0;                    // how many reservations others cancel
   int fFree = 1600;                             // bytes of the event log
   bool fHasLostEntries = false, fHasClock = true;
@@ -63,7 +64,7 @@ private:
   TAnswer RecordPart(std::string const& data) {
     if (fLostReservations > 0 && fLostReservations-- > 0) return Refusal(kReservationLost);
     auto const offset = static_cast<std::uint8_t>(data[4]), length = static_cast<std::uint8_t>(data[5]);
-    if (length > fLongestPart) return Refusal(kTooLong);
+    if (length > fLongestPart) return Refusal(fTooLong);
     std::size_t const index = IndexIn(data);
     if (index >= fRecords.size()) return Refusal(0xCB);
     return Bytes({0}) + Next(index, fRecords.size()) + fRecords[index].substr(offset, length);
@@ -73,6 +74,7 @@ private:
     auto const byte = [&](std::size_t place) { return static_cast<std::uint8_t>(data[place]); };
     std::size_t const offset = byte(1) + 256U * byte(2);
     if (offset >= fFru.size()) return Refusal(0xC9);
+    if (byte(3) > fLongestPart) return Refusal(fTooLong);
     std::string const part = fFru.substr(offset, byte(3));
     return Bytes({0, static_cast<int>(part.size())}) + part;
   }

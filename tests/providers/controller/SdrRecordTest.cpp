@@ -49,6 +49,27 @@ TEST(SdrRecordTest, ACompactSensorHasNoNumber) {
   EXPECT_EQ(ValueOf(sensor->fScale, 1).Why().fCode, kMissingNotApplicable);
 }
 
+TEST(SdrRecordTest, AFullRecordOfASensorWithStatesHasNoNumber) {
+  std::string record = FullSensorRecord(1, 0x51, "PSU 1");
+  record[13] = '\x6F';  // reading type
+  record[21] = 0;       // unit
+  EXPECT_FALSE(SdrRecordFrom(record).fSensor->fScale.HasNumber());
+  record[21] = 6;
+  EXPECT_TRUE(SdrRecordFrom(record).fSensor->fScale.HasNumber()) << "a unit";
+  record[21] = 0;
+  record[20] = 1;
+  EXPECT_TRUE(SdrRecordFrom(record).fSensor->fScale.HasNumber()) << "a percentage";
+}
+
+TEST(SdrRecordTest, AnEventOnlySensorHasAName) {
+  auto const sensor = SdrRecordFrom(EventOnlyRecord(2, 0x77, 0x12, "Power On")).fSensor;
+  ASSERT_TRUE(sensor);
+  EXPECT_EQ(sensor->fKind, TSdrSensor::EKind::kEventOnly);
+  EXPECT_EQ(sensor->fNumber, 0x77);
+  EXPECT_EQ(sensor->fType, 0x12);
+  EXPECT_EQ(*sensor->fName, "Power On");
+}
+
 TEST(SdrRecordTest, AFruDeviceIsLocated) {
   auto const fru = SdrRecordFrom(FruLocatorRecord(3, 5, "Riser")).fFru;
   ASSERT_TRUE(fru);

@@ -59,6 +59,9 @@ std::vector<TSubject> const& Subjects() {
   return subjects;
 }
 
+// The time of an entry without one, as the DMTF schema prescribes it.
+bool IsUnknownTime(std::string const& text) { return text.rfind("9999", 0) == 0; }
+
 // "20210201T..." as "2021-02-01 00:00:00"; an interval, which counts from the start of the controller, as it is.
 std::string TimeText(std::string const& text) {
   if (text.size() < 14 || text.find('+') == std::string::npos) return text;
@@ -92,6 +95,7 @@ TCell CellOf(TNamespaceView const& view, ICIMInstance const& instance, char cons
   if (isReading) return TCell::Known(ReadingText(view, instance, *answer.fValue), answer.fSource);
   std::string const word = WordOf(instance, property, *answer.fValue);
   bool const isTime = answer.fValue->GetType() == TCIMValue::TCIMType::kCIMTypeDateTime;
+  if (isTime && IsUnknownTime(word)) return TCell::Unknown({kMissingNotGiven, "the entry has no time"}, answer.fSource);
   return TCell::Known(isTime ? TimeText(word) : word, answer.fSource);
 }
 
