@@ -12,7 +12,6 @@ constexpr char const* kSysfs = "/sys/firmware";
 constexpr char const* kEfi = "/sys/firmware/efi";
 std::string const kVariables = "/sys/firmware/efi/efivars/";
 std::string const kGlobal = "-8be4df61-93ca-11d2-aa0d-00e098032b8c";  // the vendor GUID of the UEFI standard's own variables
-std::string const kTpms = "/sys/class/tpm/";
 
 TFinding<bool> IsUefi(TMachineFiles const& files) {
   if (!files.Exists(kSysfs)) return TMissing{kMissingNotGiven, std::string(kSysfs) + " does not exist"};
@@ -54,40 +53,6 @@ TFinding<std::string> WakeUpTypeFrom(std::uint8_t type) {
   return WordFor(type, words, 3, "wake-up type");
 }
 
-// A TPM 1.2 reports its version in the file caps: "TCG version: 1.2".
-TFinding<std::string> TpmVersionOf(TMachineFiles const& files, std::string const& directory) {
-  auto const major = files.Line(directory + "tpm_version_major");
-  if (major) return *major == "1" ? std::string("1.2") : *major + ".0";
-  auto const caps = files.Content(directory + "caps");
-  if (!caps) return major.Why();
-  std::string const name = "TCG version: ";
-  std::size_t const at = caps->find(name);
-  if (at == std::string::npos) return TMissing{kMissingNotGiven, directory + "caps contains no version"};
-  std::size_t const start = at + name.size();
-  return caps->substr(start, caps->find('\n', start) - start);
-}
-
-// The hash algorithms whose registers the kernel lists: pcr-sha256.
-std::vector<std::string> BanksOf(TMachineFiles const& files, std::string const& directory) {
-  std::vector<std::string> banks;
-  for (std::string const& name : files.Names(directory))
-    if (name.compare(0, 4, "pcr-") == 0) banks.push_back(name.substr(4));
-  return banks;
-}
-
-TRecord TpmRecord(TMachineFiles const& files, TSystemName const& name, std::string const& id) {
-  std::string const directory = kTpms + id + "/";
-  TRecord record("ZEP_TrustedPlatformModule", kTpms, "CIM_LogicalDevice");
-  record.AddKey("SystemCreationClassName", TCIMSchemaHelper::kSystemCreationClassName);
-  record.AddPropagatedKey("SystemName", name.fName);
-  record.AddKey("CreationClassName", "ZEP_TrustedPlatformModule");
-  record.AddKey("DeviceID", id);
-  record.Add("ElementName", files.Line(directory + "device/description"));
-  record.Add("SpecificationVersion", TpmVersionOf(files, directory));
-  record.Add("RegisterBanks", TFinding<std::vector<std::string>>(BanksOf(files, directory)));
-  return record;
-}
-
 }  // namespace
 
 TRecord BootRecord(TMachineFiles const& files, TSourcedStructure const& status, TSourcedStructure const& system) {
@@ -106,13 +71,5 @@ TRecord BootRecord(TMachineFiles const& files, TSourcedStructure const& status, 
   record.Add("WakeUpType", system.fStructure.Byte(0x18).Then(WakeUpTypeFrom));
   return record;
 }
-
-std::vector<TRecord> TpmRecords(TMachineFiles const& files, TSystemName const& name) {
-  std::vector<TRecord> records;
-  for (std::string const& id : files.Names(kTpms)) records.push_back(TpmRecord(files, name, id));
-  return records;
-}
-
-TRecord TpmShape(TSystemName const& name) { return TpmRecord(TMachineFiles("/nonexistent"), name, ""); }
 
 }  // namespace NQRVZEP20

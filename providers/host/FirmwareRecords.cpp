@@ -4,20 +4,13 @@
 #include "BoardRecords.h"
 #include "SmbiosFields.h"
 
+#include <cstdio>
+
 namespace NQRVZEP20 {
 
 namespace {
 
 using TTexts = TFinding<std::vector<std::string>>;
-
-// The words for the bits that are set, from bit `first` on.
-template <class TBits, std::size_t N>
-std::vector<std::string> WordsFor(TBits bits, char const* const (&words)[N], unsigned first) {
-  std::vector<std::string> found;
-  for (std::size_t at = 0; at < N; ++at)
-    if (bits >> (first + at) & 1) found.emplace_back(words[at]);
-  return found;
-}
 
 // ---- BIOS ----
 
@@ -119,6 +112,31 @@ TFinding<std::string> TechnologyFrom(std::uint8_t technology) {
   return WordFor(technology, words, 3, "memory technology");
 }
 
+TTexts OperatingModesFrom(std::uint16_t bits) {
+  constexpr char const* words[] = {"Volatile memory", "Byte-accessible persistent memory",
+                                   "Block-accessible persistent memory"};  // from bit 3
+  auto found = WordsFor(bits, words, 3);
+  if (found.empty()) return Unknown();
+  return found;
+}
+
+// The number of a maker by JEDEC: the lower byte counts the banks before its own, the upper one is its code there.
+TFinding<std::string> MakerAt(TSmbiosStructure const& memoryDevice, std::size_t offset) {
+  return NumberOf<std::uint16_t>(memoryDevice.Word(offset), std::uint16_t(0)).Then([](std::uint16_t number) {
+    char text[32];
+    std::snprintf(text, sizeof text, "Bank %d, Hex 0x%02X", (number & 0x7f) + 1, number >> 8);
+    return std::string(text);
+  });
+}
+
+TFinding<std::uint16_t> ProductAt(TSmbiosStructure const& memoryDevice, std::size_t offset) {
+  return NumberOf<std::uint16_t>(memoryDevice.Word(offset), std::uint16_t(0));
+}
+
+TFinding<std::uint64_t> SizeAt(TSmbiosStructure const& memoryDevice, std::size_t offset) {
+  return NumberOf<std::uint64_t>(memoryDevice.QWord(offset), ~std::uint64_t(0));
+}
+
 TFinding<std::uint8_t> RankFrom(std::uint8_t attributes) {
   return NumberOf<std::uint8_t>(TFinding<std::uint8_t>(attributes & 0x0f), std::uint8_t(0));
 }
@@ -171,6 +189,16 @@ TRecord ModuleSettingsRecord(TSmbiosStructure const& memoryDevice, TSmbiosStruct
   TRecord record = SettingsRecord("ZEP_MemoryModuleSettings", source, "Memory device " + std::to_string(number));
   record.Add("TypeDetails", memoryDevice.Word(0x13).Then(TypeDetailsFrom));
   record.Add("Technology", memoryDevice.Byte(0x28).Then(TechnologyFrom));
+  record.Add("OperatingModes", memoryDevice.Word(0x29).Then(OperatingModesFrom));
+  record.Add("FirmwareVersion", TextOf(memoryDevice, 0x2b));
+  record.Add("ModuleManufacturerID", MakerAt(memoryDevice, 0x2c));
+  record.Add("ModuleProductID", ProductAt(memoryDevice, 0x2e));
+  record.Add("ControllerManufacturerID", MakerAt(memoryDevice, 0x30));
+  record.Add("ControllerProductID", ProductAt(memoryDevice, 0x32));
+  record.Add("NonVolatileSize", SizeAt(memoryDevice, 0x34)).Unit("byte");
+  record.Add("VolatileSize", SizeAt(memoryDevice, 0x3c)).Unit("byte");
+  record.Add("CacheSize", SizeAt(memoryDevice, 0x44)).Unit("byte");
+  record.Add("LogicalSize", SizeAt(memoryDevice, 0x4c)).Unit("byte");
   record.Add("Ranks", memoryDevice.Byte(0x1b).Then(RankFrom));
   record.Add("ErrorCorrection", ErrorCorrectionOf(array));
   record.Add("MinimumVoltage", MillivoltsAt(memoryDevice, 0x22)).Unit("volt * 10^-3");

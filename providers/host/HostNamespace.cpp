@@ -12,6 +12,7 @@
 #include "RunningRecords.h"
 #include "ScsiRecords.h"
 #include "SmbiosRecords.h"
+#include "TpmRecords.h"
 #include "Virtualization.h"
 #include "providers/memory/TMemoryNamespace.h"
 #include "providers/reasons/TRecordWriter.h"
@@ -101,12 +102,19 @@ void WriteFirmware(THostContext const& host, TFinding<TKernelProcessors> const& 
                       {host.fTables.First(kSmbiosSystem), host.fTables.SourceOf(kSmbiosSystem)});
   });
   WriteSettings(host, [&](TMachineFiles const& files) { return VirtualizationRecord(files, processors); });
+}
 
+void WriteTpms(THostContext const& host) {
   auto const& files = host.fHardwareFiles;
-  auto const modules = files ? TpmRecords(*files, host.fName) : std::vector<TRecord>();
-  host.fWriter.Write(
-      TpmShape(host.fName), modules,
-      files ? TMissing{kMissingNotGiven, "the kernel lists no trusted platform module in /sys/class/tpm"} : files.Why());
+  auto const structures = host.fTables.All(kSmbiosTpm);
+  TSourcedStructure const absent{
+      TSmbiosStructure(WhyNonePresent(host.fTables, kSmbiosTpm, "the SMBIOS tables describe fewer modules than the kernel")),
+      host.fTables.SourceOf(kSmbiosTpm)};
+  auto const modules = TpmRecords(files, structures, absent, host.fName);
+  host.fWriter.Write(TpmShape(absent, host.fName), modules,
+                     files ? TMissing{kMissingNotGiven,
+                                      "neither the kernel (/sys/class/tpm) nor the SMBIOS tables list a trusted platform module"}
+                           : files.Why());
   for (TRecord const& module : modules) host.fWriter.Associate(kSystemDevice, host.fSystem, module);
 }
 
@@ -137,6 +145,7 @@ void FillHostNamespace(TMemoryNamespace& ns) {
   auto const processors = WriteProcessors(host);
   WriteBoards(host, chassis, WriteMemory(host, processors));
   WriteFirmware(host, processors.fKernel);
+  WriteTpms(host);
   WriteScsiDevices(host);
   writer.WriteMissing();
 }

@@ -45,4 +45,13 @@ TFinding<std::string> WordFor(unsigned number, char const* const (&words)[N], un
   return std::string(words[number - first]);
 }
 
+// The words for the bits that are set, from bit `first` on.
+template <class TBits, std::size_t N>
+std::vector<std::string> WordsFor(TBits bits, char const* const (&words)[N], unsigned first) {
+  std::vector<std::string> found;
+  for (std::size_t at = 0; at < N; ++at)
+    if (bits >> (first + at) & 1) found.emplace_back(words[at]);
+  return found;
+}
+
 }  // namespace NQRVZEP20

@@ -84,6 +84,8 @@ char const* NameOf(int type) {
       return "IPMI Device Information";
     case kSmbiosOnboardDevice:
       return "Onboard Devices Extended Information";
+    case kSmbiosTpm:
+      return "TPM Device";
     default:
       return "other";
   }

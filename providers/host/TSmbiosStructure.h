@@ -24,6 +24,7 @@ constexpr int kSmbiosMemoryDevice = 17;
 constexpr int kSmbiosBoot = 32;
 constexpr int kSmbiosIpmi = 38;
 constexpr int kSmbiosOnboardDevice = 41;
+constexpr int kSmbiosTpm = 43;
 
 // One SMBIOS structure: a header of four bytes, the formatted area, and the string set. Never reads out of bounds, even if the
 // structure is malformed. Numbers are little-endian; offsets are from the start of the header, as in the SMBIOS standard.
@@ -58,6 +59,12 @@ private:
 
   std::vector<unsigned char> fBytes;
   TMissing fWhyAbsent;  // its code is empty when the structure is present
+};
+
+// A structure and the source of its values: "SMBIOS type 17".
+struct TSourcedStructure {
+  TSmbiosStructure fStructure;
+  std::string fSource;
 };
 
 }  // namespace NQRVZEP20

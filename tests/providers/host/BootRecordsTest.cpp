@@ -63,21 +63,5 @@ TEST_F(BootRecordsTest, TheWakeUpTypeIsAWordOfTheStandard) {
   EXPECT_EQ(Boot("WakeUpType"), "string NULL not-given: the firmware reports it as unknown");
 }
 
-TEST_F(BootRecordsTest, ATpmHasItsVersionAndItsBanks) {
-  fTree.Write("/sys/class/tpm/tpm0/tpm_version_major", "2");
-  fTree.Write("/sys/class/tpm/tpm0/pcr-sha1/0", "");
-  fTree.Write("/sys/class/tpm/tpm0/pcr-sha256/0", "");
-  fTree.Write("/sys/class/tpm/tpm1/caps", "Manufacturer: 0x49465800\nTCG version: 1.2\nFirmware version: 3.17");
-  fTree.Write("/sys/class/tpm/tpm2/caps", "none");
-  auto const records = TpmRecords(TMachineFiles(fRoot.Path()), TSystemName{"db1", "uname"});
-  ASSERT_EQ(records.size(), 3u);
-  EXPECT_EQ(PropertyOf(records[0], "DeviceID"), "string tpm0");
-  EXPECT_EQ(PropertyOf(records[0], "SpecificationVersion"), "string 2.0");
-  EXPECT_EQ(PropertyOf(records[0], "RegisterBanks"), "string { sha1, sha256 }");
-  EXPECT_EQ(PropertyOf(records[1], "SpecificationVersion"), "string 1.2");
-  EXPECT_EQ(PropertyOf(records[2], "SpecificationVersion"),
-            "string NULL not-given: /sys/class/tpm/tpm2/caps contains no version");
-}
-
 }  // namespace
 }  // namespace NQRVZEP20

@@ -72,6 +72,23 @@ TEST(FirmwareRecordsTest, AModuleHasTheErrorCorrectionOfItsArray) {
   EXPECT_EQ(PropertyOf(old, "ErrorCorrection"), "string NULL code: why");
 }
 
+TEST(FirmwareRecordsTest, AModuleThatKeepsItsContentsHasItsSizesAndMakers) {
+  TStructureMaker maker(17, 0x5c);
+  maker.Byte(0x28, 4).Word(0x29, 0x18).Text(0x2b, "NV 1.2").Word(0x2c, 0x2c83).Word(0x2e, 0x4410).DWord(0x34, 1 << 30);
+  maker.Bytes(0x3c, std::string(8, '\xff'));
+  ExpectProperties(ModuleSettingsRecord(maker.Make(), TStructureMaker(16, 0x17).Make(), "SMBIOS type 17", 0),
+                   {{"Technology", "string NVDIMM-N"},
+                    {"OperatingModes", "string { Volatile memory, Byte-accessible persistent memory }"},
+                    {"FirmwareVersion", "string NV 1.2"},
+                    {"ModuleManufacturerID", "string Bank 4, Hex 0x2C"},
+                    {"ModuleProductID", "uint16 17424"},
+                    {"ControllerManufacturerID", kUnknownText},
+                    {"ControllerProductID", "uint16 NULL not-given: the firmware reports it as unknown"},
+                    {"NonVolatileSize", "uint64 1073741824"},
+                    {"VolatileSize", "uint64 NULL not-given: the firmware reports it as unknown"},
+                    {"CacheSize", "uint64 0"}});
+}
+
 TEST(FirmwareRecordsTest, AProcessorIsAChipWithNumbersOfItsMaker) {
   TStructureMaker maker(4, 0x30);
   maker.Text(0x04, "CPU 1").Text(0x07, "Example Works").Text(0x10, "Processor 44").Byte(0x11, 0x8c);
