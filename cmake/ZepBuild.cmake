@@ -89,9 +89,9 @@ function(zep_loaded_library name file)
 endfunction()
 
 # A GoogleTest program; ctest runs each of its tests separately. LIBS are linked in addition to the library. Tests with the
-# same LOCK never run at the same time.
+# same LOCK never run at the same time. DOCUMENTS: the tests keep documents of zep, which documents.schema validates after them.
 function(zep_test name)
-  cmake_parse_arguments(ARG "" "TIMEOUT;LOCK" "SOURCES;LIBS;LABELS;ENVIRONMENT" ${ARGN})
+  cmake_parse_arguments(ARG "DOCUMENTS" "TIMEOUT;LOCK" "SOURCES;LIBS;LABELS;ENVIRONMENT" ${ARGN})
   if(NOT ARG_TIMEOUT)
     set(ARG_TIMEOUT 60)
   endif()
@@ -108,6 +108,9 @@ function(zep_test name)
   endif()
   if(ARG_ENVIRONMENT)
     list(APPEND properties ENVIRONMENT "${ARG_ENVIRONMENT}")
+  endif()
+  if(ARG_DOCUMENTS)
+    list(APPEND properties FIXTURES_REQUIRED documents)
   endif()
   if(ARG_LOCK)
     list(APPEND properties RESOURCE_LOCK "${ARG_LOCK}")

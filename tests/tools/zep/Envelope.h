@@ -3,6 +3,8 @@
 
 // The members that every JSON document of zep has.
 
+#include "tests/tools/zep/Documents.h"
+
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
@@ -13,6 +15,7 @@ namespace NQRVZEP20::zep {
 // Expects a document of that name that contains the exit status and, unless the status is 0, a reason.
 inline void ExpectEnvelope(nlohmann::json const& document, int status, std::string const& name) {
   SCOPED_TRACE(document.dump());
+  KeepDocument(document);
   ASSERT_TRUE(document.is_object());
   for (char const* member : {"document", "version", "zep", "sample", "exitStatus", "reason"})
     ASSERT_TRUE(document.contains(member)) << member;

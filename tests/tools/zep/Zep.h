@@ -4,6 +4,7 @@
 // Runs zep as users do: the real program, as a child process, in a copy of the files of an installation.
 
 #include "tests/SmbiosTables.h"
+#include "tests/tools/zep/Documents.h"
 
 #include <fcntl.h>
 #include <grp.h>
@@ -72,6 +73,7 @@ public:
     if (child == 0) Exec(call);
     int status = 0;
     ::waitpid(child, &status, 0);
+    KeepDocuments(ReadFile(Path("out")));
     return {WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status), WithoutSeconds(ReadFile(Path("out"))),
             WithoutSeconds(ReadFile(Path("err")))};
   }
