@@ -29,7 +29,7 @@ struct TZepController {
   void (*fProgress)(char const* step, unsigned long done, unsigned long all);
 
   /* No command is sent after this time. */
-  unsigned fSeconds;
+  unsigned fMilliseconds;
 };
 
 #ifdef __cplusplus

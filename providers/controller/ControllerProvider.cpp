@@ -21,7 +21,7 @@ constexpr std::chrono::seconds kLocalLimit{30};
 TZepController const* gRemote = nullptr;
 
 TIpmi Connection() {
-  if (gRemote != nullptr) return WithinTime(SessionConnection(*gRemote), std::chrono::seconds(gRemote->fSeconds));
+  if (gRemote != nullptr) return WithinTime(SessionConnection(*gRemote), std::chrono::milliseconds(gRemote->fMilliseconds));
   TMachineFiles const files = TMachineFiles::OfThisProcess();
   return Recorded(files.IsThisMachine() ? WithinTime(LocalConnection(), kLocalLimit) : TIpmi(), files);
 }

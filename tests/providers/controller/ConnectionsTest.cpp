@@ -45,7 +45,7 @@ TEST(RecordedTest, AnswersAreRecordedAndReadAgain) {
 TEST(SessionConnectionTest, AnAnswerOfNoBytesOrTooManyIsNone) {
   static unsigned length;
   TZepController const controller = {
-      "s", [](unsigned char, unsigned char, unsigned char const*, unsigned, unsigned char*) { return length; }, nullptr, 1};
+      "s", [](unsigned char, unsigned char, unsigned char const*, unsigned, unsigned char*) { return length; }, nullptr, 1000};
   for (unsigned const bad : {0U, unsigned(kZepControllerAnswerSize) + 1}) {
     length = bad;
     EXPECT_EQ(SessionConnection(controller)({6, 1}).Why().fCode, kMissingNoAnswer);

@@ -6,6 +6,7 @@
 #include "TLogger.h"
 #include "core/Handles.h"
 #include "tools/zep/commands/Commands.h"
+#include "tools/zep/commands/Thresholds.h"
 #include "tools/zep/controller/Controller.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Failure.h"
@@ -113,9 +114,9 @@ void WriteDebugLog(std::string const& path) {
   TLogger::SetLogThreshold(ILogger::kLogDebug);
 }
 
-// A quarter of the time remains for the last command and for sending.
+// A tenth of the time remains for sending what was read.
 TInventoryLimits InventoryLimitsOf(TArguments const& arguments) {
-  return {static_cast<unsigned>(arguments.fTimeoutSeconds) * 3 / 4, !arguments.fHost.empty() && CanRedrawErrors()};
+  return {std::chrono::milliseconds(900) * arguments.fTimeoutSeconds, !arguments.fHost.empty() && CanRedrawErrors()};
 }
 
 using TReport = std::function<void(TRemoteIdentity const&)>;
@@ -143,17 +144,18 @@ int AskAll(std::vector<std::string> const& hosts, TAccount const& account, TArgu
   return nothing == hosts.size() ? kExitNothing : kExitPartial;
 }
 
-int AskOne(TAccount const& account, TArguments const& arguments) {
+int AskOne(TAccount const& account, TArguments const& arguments, TThresholds const& thresholds) {
   return AskAll({arguments.fHost}, account, arguments, [&](TRemoteIdentity const& identity) {
-    WriteOutput(arguments.fAsJson ? AsText(AsJson(identity)) : AsText(identity));
+    WriteOutput(arguments.fAsJson ? AsText(AsJson(identity, thresholds)) : AsText(identity, thresholds));
     if (!identity.fError.empty()) std::cerr << "zep: " << Printable(identity.fHost + ": " + identity.fError) << "\n";
   });
 }
 
-int AskList(std::vector<std::string> const& hosts, TAccount const& account, TArguments const& arguments) {
+int AskList(std::vector<std::string> const& hosts, TAccount const& account, TArguments const& arguments,
+            TThresholds const& thresholds) {
   TProgress progress(hosts.size());
   return AskAll(hosts, account, arguments, [&](TRemoteIdentity const& identity) {
-    WriteOutput(AsLine(AsJson(identity)));
+    WriteOutput(AsLine(AsJson(identity, thresholds)));
     progress.Count(!IsComplete(identity));
   });
 }
@@ -173,7 +175,8 @@ int Remote(TArguments const& arguments) {
       arguments.fHostsFile.empty() ? std::vector<std::string>() : HostsIn(arguments.fHostsFile);
   if (!arguments.fDebugLog.empty()) WriteDebugLog(arguments.fDebugLog);
   TAccount const account = {arguments.fUser, ControllerPassword(arguments.fUser, arguments.fPasswordFile)};
-  return arguments.fHostsFile.empty() ? AskOne(account, arguments) : AskList(hosts, account, arguments);
+  TThresholds const thresholds = arguments.fHasInventory ? ThresholdSettings() : TThresholds();
+  return arguments.fHostsFile.empty() ? AskOne(account, arguments, thresholds) : AskList(hosts, account, arguments, thresholds);
 }
 
 }  // namespace

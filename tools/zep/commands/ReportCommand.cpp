@@ -2,11 +2,10 @@
 
 // zep report: which machine this is.
 
-#include "TConfig.h"
-#include "TOSSpecific.h"
 #include "collect/Report.h"
 #include "tools/zep/commands/Commands.h"
 #include "tools/zep/commands/Providers.h"
+#include "tools/zep/commands/Thresholds.h"
 #include "tools/zep/media/TMountedMedium.h"
 #include "tools/zep/output/FindingsText.h"
 #include "tools/zep/output/Json.h"
@@ -21,7 +20,6 @@
 
 #include <CLI/CLI.hpp>
 
-#include <algorithm>
 #include <iostream>
 #include <memory>
 #include <optional>
@@ -43,22 +41,6 @@ struct TArguments {
   std::string fFailOn;  // a severity; empty for none
   std::string fMedium;  // the device to write to; empty for standard output
 };
-
-// The settings of the working directory. The library logs a missing or empty file as an error, so it is not read then.
-std::string SettingOf(std::string const& key) {
-  constexpr char const* file = "zep.cfg";
-  if (!TOSSpecific::FileExists(file) || TOSSpecific::GetFileSize(file) == 0) return "";
-  auto const keys = TConfig::GetInstance()->listKeys();
-  return std::find(keys.begin(), keys.end(), key) != keys.end() ? TConfig::GetInstance()->getValue(key) : "";
-}
-
-TReportRules RulesWithSettings() {
-  try {
-    return {TThresholds::From(SettingOf)};
-  } catch (std::invalid_argument const& failure) {
-    throw TWrongUsage(std::string(failure.what()) + " (zep.cfg)");
-  }
-}
 
 // Whether the findings make the command fail.
 bool FailsBecauseOfFindings(TReport const& report, TArguments const& arguments) {
@@ -157,7 +139,7 @@ int Report(TArguments const& arguments) {
     TTarget const target = arguments.fTarget.empty() ? TTarget{} : TargetOf(arguments.fTarget, arguments.fBySftp);
     if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
     sample = SampleIf(arguments.fSample);
-    TReportRules const rules = RulesWithSettings();
+    TReportRules const rules = {ThresholdSettings()};
     return Deliver(MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample, rules), target, arguments, guard);
   } catch (std::exception const& failure) {
     bool const isOfMedium = !arguments.fMedium.empty() && arguments.fAsJson && !HasWrittenOutput();

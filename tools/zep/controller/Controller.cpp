@@ -111,7 +111,7 @@ void QueryController(std::string const& host, TAccount const& account, TInventor
   add("model", TOSSpecific::GetRemoteMachineModel(host, account.fUser, password));
   add("serial number", TOSSpecific::GetRemoteMSN(host, account.fUser, password));
   send(WhyNotAll(fields) + kEnd);
-  if (inventory != nullptr) SendInventory(host, inventory->After(TClock::now() - start), send);
+  if (inventory != nullptr && !SendInventory(host, inventory->After(TClock::now() - start), send)) return;
   IIPMILan::GetInstance()->IpmilanCloseConnect();
 }
 
@@ -138,24 +138,24 @@ EExitStatus StatusOf(TRemoteIdentity const& identity) {
   return IsNothing(identity) ? kExitNothing : kExitPartial;
 }
 
-TJson AsJson(TRemoteIdentity const& identity) {
+TJson AsJson(TRemoteIdentity const& identity, TThresholds const& thresholds) {
   TJson document = DocumentHead("zep remote", StatusOf(identity), identity.fError);
   document["host"] = identity.fHost;
   document["type"] = OrNull(identity.fType);
   document["model"] = OrNull(identity.fModel);
   document["serialNumber"] = OrNull(identity.fSerialNumber);
   if (!identity.fError.empty()) document["error"] = identity.fError;  // the same reason, under the name of earlier versions
-  if (identity.fInventory) AddInventory(document, *identity.fInventory);
+  if (identity.fInventory) AddInventory(document, *identity.fInventory, thresholds);
   return document;
 }
 
-std::string AsText(TRemoteIdentity const& identity) {
+std::string AsText(TRemoteIdentity const& identity, TThresholds const& thresholds) {
   TTable table({15, 61});
   table.Add({"Remote server", MessageWithoutSecrets(identity.fHost)});
   table.Add({"Machine type", OrUnknown(identity.fType)});
   table.Add({"Model", OrUnknown(identity.fModel)});
   table.Add({"Serial number", OrUnknown(identity.fSerialNumber)});
-  return table.GetText() + (identity.fInventory ? InventoryAsText(*identity.fInventory) : "");
+  return table.GetText() + (identity.fInventory ? InventoryAsText(*identity.fInventory, thresholds) : "");
 }
 
 }  // namespace NQRVZEP20::zep

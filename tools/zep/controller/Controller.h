@@ -44,8 +44,8 @@ bool IsNothing(TRemoteIdentity const& identity);
 // The exit status of zep if this is the only host.
 EExitStatus StatusOf(TRemoteIdentity const& identity);
 
-// The JSON document of "zep remote".
-TJson AsJson(TRemoteIdentity const& identity);
-std::string AsText(TRemoteIdentity const& identity);
+// The JSON document of "zep remote". `thresholds`: for the findings of the inventory.
+TJson AsJson(TRemoteIdentity const& identity, TThresholds const& thresholds = {});
+std::string AsText(TRemoteIdentity const& identity, TThresholds const& thresholds = {});
 
 }  // namespace NQRVZEP20::zep

@@ -14,7 +14,10 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <future>
 #include <iostream>
+#include <optional>
+#include <thread>
 
 namespace NQRVZEP20::zep {
 
@@ -23,13 +26,27 @@ namespace {
 constexpr char const* kProvider = "Controller";
 constexpr char kEnd = '\0';  // of the reason, which precedes the namespace
 
+// Of the session: when to stop, and whether a command was not answered by then.
+std::chrono::steady_clock::time_point gEnd;
+bool gIsWaiting = false;
+
+// The library waits for an answer as long as it likes, so that it does so in a thread of its own.
+std::optional<TIpmiAnswer> AnswerInTime(TIpmiCommand const& command) {
+  std::packaged_task<TIpmiAnswer()> task([command] { return AskIpmiController(command); });
+  auto answer = task.get_future();
+  std::thread(std::move(task)).detach();
+  gIsWaiting = answer.wait_until(gEnd) != std::future_status::ready;
+  return gIsWaiting ? std::nullopt : std::optional(answer.get());
+}
+
 unsigned SendCommand(unsigned char netFn, unsigned char command, unsigned char const* data, unsigned dataLength,
                      unsigned char* answer) {
-  TIpmiAnswer const reply = AskIpmiController({netFn, command, {data, data + dataLength}});
-  if (!reply.fIsAnswered) return 0;
-  answer[0] = reply.fCompletionCode;
-  std::copy(reply.fData.begin(), reply.fData.end(), answer + 1);
-  return static_cast<unsigned>(1 + reply.fData.size());
+  if (gIsWaiting) return 0;
+  auto const reply = AnswerInTime({netFn, command, {data, data + dataLength}});
+  if (!reply || !reply->fIsAnswered) return 0;
+  answer[0] = reply->fCompletionCode;
+  std::copy(reply->fData.begin(), reply->fData.end(), answer + 1);
+  return static_cast<unsigned>(1 + reply->fData.size());
 }
 
 // The line is overwritten by the next one, and by that of the result.
@@ -48,7 +65,9 @@ boost::shared_ptr<ICIMNamespace> ReadController(std::string const& host, TInvent
   if (!plugIn.IsLoaded()) throw std::runtime_error("libController.nsp.so: " + plugIn.fReason);
   ::setenv("ZEP_HOST_NAME", host.c_str(), 1);  // the provider names the machine after it
   LoadLibraryOf(plugIn);
-  TZepController const controller = {host.c_str(), SendCommand, limits.fShowsProgress ? ShowProgress : nullptr, limits.fSeconds};
+  gEnd = std::chrono::steady_clock::now() + limits.fTime;
+  TZepController const controller = {host.c_str(), SendCommand, limits.fShowsProgress ? ShowProgress : nullptr,
+                                     static_cast<unsigned>(limits.fTime.count())};
   TCIMContext const context = {{kZepControllerEntry, TCIMValue(reinterpret_cast<unsigned long>(&controller))}};
   return TNamespaceProviderManager::GetInstance()->GetNamespaceProvider(kProvider)->GetNamespace(context);
 }
@@ -64,15 +83,16 @@ std::string WhyNotAll(TNamespaceView const& view) {
 }  // namespace
 
 TInventoryLimits TInventoryLimits::After(std::chrono::steady_clock::duration passed) const {
-  std::chrono::seconds const left = std::chrono::seconds(fSeconds) - std::chrono::ceil<std::chrono::seconds>(passed);
-  return {static_cast<unsigned>(std::max(left, std::chrono::seconds(1)).count()), fShowsProgress};
+  auto const left = fTime - std::chrono::ceil<std::chrono::milliseconds>(passed);
+  return {std::max(left, std::chrono::milliseconds(0)), fShowsProgress};
 }
 
-void SendInventory(std::string const& host, TInventoryLimits const& limits, TSend const& send) {
+bool SendInventory(std::string const& host, TInventoryLimits const& limits, TSend const& send) {
   boost::shared_ptr<ICIMNamespace> ns;
   std::string const failure = FailureOf([&] { ns = ReadController(host, limits); });
   send(failure + kEnd);
   if (ns) WriteNamespace(*ns, send);
+  return !gIsWaiting;
 }
 
 TInventory InventoryFrom(std::string sent) {

@@ -111,21 +111,23 @@ TReportSection SectionOf(TNamespaceView const& view, TSubject const& subject) {
   return section;
 }
 
-TFindings FindingsOf(TNamespaceView const& view) { return MakeFindings({view}, {}, ControllerRules()); }
+TFindings FindingsOf(TNamespaceView const& view, TThresholds const& thresholds) {
+  return MakeFindings({view}, thresholds, ControllerRules());
+}
 
 }  // namespace
 
-void AddInventory(TJson& document, TInventory const& inventory) {
-  document["findings"] = inventory.fView ? FindingsAsJson(FindingsOf(*inventory.fView)) : TJson();
+void AddInventory(TJson& document, TInventory const& inventory, TThresholds const& thresholds) {
+  document["findings"] = inventory.fView ? FindingsAsJson(FindingsOf(*inventory.fView, thresholds)) : TJson();
   TJson& instances = document["instances"] = TJson::array();
   if (!inventory.fView) return;
   TInstanceJson json(*inventory.fView);
   for (auto const& instance : inventory.fView->AllInstances()) instances.push_back(json.Of(*instance));
 }
 
-std::string InventoryAsText(TInventory const& inventory) {
+std::string InventoryAsText(TInventory const& inventory, TThresholds const& thresholds) {
   if (!inventory.fView) return "";
-  std::string text = "\n" + FindingsAsText(FindingsOf(*inventory.fView), "");
+  std::string text = "\n" + FindingsAsText(FindingsOf(*inventory.fView, thresholds), "");
   for (TSubject const& subject : Subjects()) text += "\n" + SectionAsText(SectionOf(*inventory.fView, subject), "", 0);
   return text;
 }

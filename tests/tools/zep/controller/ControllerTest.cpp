@@ -30,12 +30,11 @@ std::string WithoutHead(TJson document) {
 
 TEST(InventoryLimitsTest, TheTimeOfTheSessionIsSubtracted) {
   using namespace std::chrono_literals;
-  TInventoryLimits const limits = {90, true};
-  EXPECT_EQ(limits.After(0s).fSeconds, 90U);
-  EXPECT_EQ(limits.After(30s).fSeconds, 60U);
-  EXPECT_EQ(limits.After(30001ms).fSeconds, 59U);
-  EXPECT_EQ(limits.After(89s).fSeconds, 1U);
-  EXPECT_EQ(limits.After(200s).fSeconds, 1U);
+  TInventoryLimits const limits = {90s, true};
+  EXPECT_EQ(limits.After(0s).fTime, 90s);
+  EXPECT_EQ(limits.After(30s).fTime, 60s);
+  EXPECT_EQ(limits.After(30s + 1us).fTime, 59999ms);
+  EXPECT_EQ(limits.After(200s).fTime, 0s);
   EXPECT_TRUE(limits.After(30s).fShowsProgress);
 }
 
