@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "collect/findings/AgeText.h"
 #include "collect/findings/Findings.h"
 #include "collect/findings/Rules.h"
 
@@ -10,19 +11,11 @@ namespace NQRVZEP20 {
 
 namespace {
 
-constexpr std::uint64_t kSecondsOfADay = 86400;
-
 // The elements of a class that belong to the management controller. Without a controller, notes why the rule could not be asked,
 // in the same words for every class.
 std::vector<TElement> OfController(TRuleRun& run, char const* className) {
   if (run.Elements("ZEP_ManagementController").empty()) return {};
   return run.Elements(className);
-}
-
-std::string AgeText(std::uint64_t seconds) {
-  std::uint64_t const days = seconds / kSecondsOfADay;
-  if (days == 0) return "less than a day ago";
-  return days == 1 ? "a day ago" : std::to_string(days) + " days ago";
 }
 
 // Critical entries with the same text.
@@ -54,7 +47,9 @@ void AskEvents(TRuleRun& run) {
     std::string const often = events.fCount > 1 ? ", the last of " + std::to_string(events.fCount) : "";
     run.Add(events.fNewest, events.fSource, ESeverity::kError,
             "the controller's event log has a critical entry: " + text + " (" + AgeText(events.fAge) + often + ")",
-            "Check the part that the entry names; clear the event log when the part is repaired (ipmitool sel clear).");
+            "Check the part that this sensor watches, its power and its cooling, and replace it if the event happens again. "
+            "After the "
+            "repair, clear the event log (ipmitool sel clear).");
   }
 }
 
@@ -65,8 +60,9 @@ void AskLogFull(TRuleRun& run) {
     bool const isFull = run.Know(log, free) && *free.fValue == 0;
     if (isFull || (run.Know(log, hasLost) && *hasLost.fValue))
       run.Add(log, isFull ? free.fSource : hasLost.fSource, ESeverity::kWarning,
-              "the controller's event log is full, so that new events are lost",
-              "Save the event log, and clear it (ipmitool sel list, ipmitool sel clear).");
+              isFull ? "the controller's event log is full, so that new events are lost"
+                     : "the controller's event log was full, and has lost events",
+              "Save its entries to a file (ipmitool sel save FILE), then clear it (ipmitool sel clear).");
   }
 }
 
@@ -100,11 +96,12 @@ void AskAccounts(TRuleRun& run) {
     else if (!name.IsKnown())
       run.Add(account, state.fSource, ESeverity::kWarning,
               "the management controller has an enabled account without a name (" + *privilege.fValue + ")",
-              "Disable it (ipmitool user disable), because a login needs no user name.");
+              "Disable it (ipmitool user disable " + account.Label() + "): its password alone is enough to log in.");
     else if (IsNameOfMaker(*name.fValue) && *privilege.fValue == "Administrator")
       run.Add(account, name.fSource, ESeverity::kInformation,
               "the management controller has an account with a maker's usual name: " + *name.fValue,
-              "Make sure that its password is not the one that the maker chose.");
+              "Change its password if it is still the one that the maker chose (ipmitool user set password " + account.Label() +
+                  "): such passwords are published.");
   }
 }
 

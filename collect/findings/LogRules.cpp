@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "collect/findings/AgeText.h"
 #include "collect/findings/Rules.h"
 
 #include <algorithm>
@@ -39,22 +40,27 @@ std::string SubjectOf(TElement const& record) {
   return subject.IsKnown() ? *subject.fValue : "";
 }
 
-void NoteGoneRecords(TRuleRun& run, TElement const& log) {
-  auto const gone = log.Number("GoneRecords");
-  if (run.Know(log, gone) && *gone.fValue > 0)
-    run.NoteNotAsked({"older records of the log are gone: " + std::to_string(*gone.fValue), log.Path()});
+void NoteCount(TRuleRun& run, TElement const& log, char const* property, std::string const& reason) {
+  auto const count = log.Number(property);
+  if (run.Know(log, count) && *count.fValue > 0) run.NoteNotAsked({reason + std::to_string(*count.fValue), log.Path()});
+}
+
+// The records that no rule can judge; without the number of records, not all of them were read.
+void NoteMissingRecords(TRuleRun& run, TElement const& log) {
+  run.Know(log, log.Number("CurrentNumberOfRecords"));
+  NoteCount(run, log, "GoneRecords", "older records of the log are gone: ");
+  NoteCount(run, log, "LeftOutRecords", "older records about errors were left out: ");
 }
 
 // The records of these kinds that are young enough. Without the log, notes why the rule could not be asked.
 TRepeatedByKey RecordsOf(TRuleRun& run, std::initializer_list<EKind> kinds) {
-  constexpr std::uint64_t secondsOfADay = 86400;
   TRepeatedByKey problems;
-  for (TElement const& log : run.TryElements("ZEP_KernelLog")) NoteGoneRecords(run, log);
+  for (TElement const& log : run.TryElements("ZEP_KernelLog")) NoteMissingRecords(run, log);
   for (TElement const& record : run.Elements("ZEP_KernelLogRecord")) {
     auto const kind = record.Number("Kind"), severity = record.Number("PerceivedSeverity"), age = record.Number("Age");
     if (!run.Know(record, kind) || !run.Know(record, severity) || !run.Know(record, age)) continue;
     if (std::find(kinds.begin(), kinds.end(), *kind.fValue) == kinds.end()) continue;
-    if (*age.fValue > run.Thresholds().fKernelLogDays * secondsOfADay) continue;
+    if (*age.fValue > run.Thresholds().fKernelLogDays * kSecondsOfADay) continue;
     TRepeated& problem =
         problems.try_emplace({*kind.fValue, *severity.fValue, SubjectOf(record)}, TRepeated{record, 0, *age.fValue})
             .first->second;
@@ -62,17 +68,6 @@ TRepeatedByKey RecordsOf(TRuleRun& run, std::initializer_list<EKind> kinds) {
     if (*age.fValue <= problem.fAge) problem.fNewest = record, problem.fAge = *age.fValue;
   }
   return problems;
-}
-
-std::string Counted(std::uint64_t count, char const* unit) {
-  return std::to_string(count) + " " + unit + (count == 1 ? " ago" : "s ago");
-}
-
-std::string AgeText(std::uint64_t seconds) {
-  if (seconds < 60) return "less than a minute ago";
-  if (seconds < 3600) return Counted(seconds / 60, "minute");
-  if (seconds < 2 * 86400) return Counted(seconds / 3600, "hour");
-  return Counted(seconds / 86400, "day");
 }
 
 // ", 3 times, most recently 5 hours ago"
@@ -83,7 +78,7 @@ std::string Often(TRepeated const& problem) {
 
 std::string MessageOf(TRepeated const& problem) {
   auto const text = problem.fNewest.Text("RecordData");
-  return text.IsKnown() ? " (" + *text.fValue + ")" : "";
+  return text.IsKnown() ? " (" + text.fValue->substr(0, text.fValue->find('\n')) + ")" : "";
 }
 
 void AddProblem(TRuleRun& run, TRepeated const& problem, ESeverity severity, std::string const& reason,
@@ -137,13 +132,15 @@ void AskHardware(TRuleRun& run) {
   }
 }
 
-// Whether a SCSI, SATA or USB disk has vanished since the error: someone may have pulled out a USB stick.
+// Whether a SCSI, SATA or USB disk, or the one that has this partition, has vanished since the error: someone may have pulled out
+// a USB stick.
 bool WasRemoved(TRuleRun const& run, std::string const& disk) {
   if (disk.compare(0, 2, "sd") != 0) return false;
+  std::string const withoutPartition = disk.substr(0, disk.find_last_not_of("0123456789") + 1);
   auto const drives = run.TryElements("CIM_MediaAccessDevice");
   return !drives.empty() && std::none_of(drives.begin(), drives.end(), [&](TElement const& drive) {
     auto const name = drive.Text("DeviceID");
-    return name.IsKnown() && *name.fValue == disk;
+    return name.IsKnown() && *name.fValue == withoutPartition;
   });
 }
 

@@ -97,22 +97,51 @@ void AskUnpluggedPort(TRuleRun& run) {
   }
 }
 
-void AskBond(TRuleRun& run) {
-  for (TElement const& member : run.Elements("ZEP_BondMember")) {
-    auto const status = member.Text("MIIStatus");
-    if (!run.Know(member, status) || *status.fValue == "up") continue;
-    auto const bond = member.Text("BondName");
-    run.Add(member, status.fSource, ESeverity::kError,
-            "the bond " + (bond.IsKnown() ? *bond.fValue : "") + " lacks its member " + member.Label() + ", which has no link",
-            kCheckCable);
+std::set<std::string> InterfacesSwitchedOff(TRuleRun const& run) {
+  std::set<std::string> names;
+  for (TElement const& interface : run.TryElements("ZEP_NetworkInterface")) {
+    auto const state = interface.Text("EnabledState");
+    if (state.IsKnown() && *state.fValue == "3") names.insert(interface.Label());
   }
+  return names;
+}
+
+std::string SwitchOn(std::string const& interface) { return "Switch it on (ip link set dev " + interface + " up)"; }
+
+// The members of a bond that is switched off have no link, either.
+void AskBondMembers(TRuleRun& run, std::set<std::string> const& off) {
+  for (TElement const& member : run.Elements("ZEP_BondMember")) {
+    auto const status = member.Text("MIIStatus"), bond = member.Text("BondName");
+    if (!run.Know(member, status) || *status.fValue == "up" || (bond.IsKnown() && off.count(*bond.fValue) > 0)) continue;
+    bool const isOff = off.count(member.Label()) > 0;
+    run.Add(member, status.fSource, ESeverity::kError,
+            "the bond " + (bond.IsKnown() ? *bond.fValue : "") + " lacks its member " + member.Label() +
+                (isOff ? ", which is switched off" : ", which has no link"),
+            isOff ? SwitchOn(member.Label()) + "." : kCheckCable);
+  }
+}
+
+// The kernel makes a bond without members, switched off, when it loads the module.
+void AskBonds(TRuleRun& run, std::set<std::string> const& off) {
   for (TElement const& bond : run.TryElements("ZEP_Bond")) {
     auto const members = bond.Number("NumberOfMembers");
-    if (!run.Know(bond, members) || *members.fValue > 1) continue;
-    run.Add(bond, members.fSource, ESeverity::kWarning,
-            "the bond " + bond.Label() + (*members.fValue == 0 ? " has no member" : " has only one member"),
-            "Add the interfaces that belong to it.");
+    if (!run.Know(bond, members)) continue;
+    bool const isOff = off.count(bond.Label()) > 0;
+    if (isOff && *members.fValue > 0)
+      run.Add(bond, members.fSource, ESeverity::kWarning,
+              "the bond " + bond.Label() + " is switched off, although it has members",
+              SwitchOn(bond.Label()) + ", or remove it if it is not needed.");
+    else if (!isOff && *members.fValue < 2)
+      run.Add(bond, members.fSource, ESeverity::kWarning,
+              "the bond " + bond.Label() + (*members.fValue == 0 ? " has no member" : " has only one member"),
+              "Add the interfaces that belong to it.");
   }
+}
+
+void AskBond(TRuleRun& run) {
+  auto const off = InterfacesSwitchedOff(run);
+  AskBondMembers(run, off);
+  AskBonds(run, off);
 }
 
 }  // namespace

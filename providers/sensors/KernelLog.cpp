@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "KernelLog.h"
 
+#include "core/Handles.h"
+
 #include <fcntl.h>
 #include <unistd.h>
 
@@ -31,8 +33,6 @@ public:
     if (event) Keep(std::move(*event));
   }
 
-  bool IsFull() const { return fLog.fRecords + fLog.fUnreadable >= kMostKernelRecords; }
-
   TKernelLog Finish(bool isWhole) {
     fLog.fIsWhole = isWhole;
     for (auto& events : fEvents)
@@ -57,20 +57,6 @@ private:
   std::array<std::deque<TKernelEvent>, TKernelEvent::kKinds> fEvents;
 };
 
-class TDevice {
-public:
-  TDevice() : fFd(::open(kPath, O_RDONLY | O_NONBLOCK | O_CLOEXEC | O_NOCTTY)) {}
-  TDevice(TDevice const&) = delete;
-  TDevice& operator=(TDevice const&) = delete;
-  ~TDevice() {
-    if (fFd >= 0) ::close(fFd);
-  }
-  int Get() const { return fFd; }
-
-private:
-  int const fFd;
-};
-
 // A reason, also if the system has no such device: then errors in the log are unknown.
 TMissing WhyUnreadable(int error) {
   if (error == ENOENT) return {kMissingUnreadable, "/dev/kmsg does not exist, as in most containers"};
@@ -81,18 +67,17 @@ TMissing WhyUnreadable(int error) {
 std::string_view FirstLine(std::string_view text) { return text.substr(0, text.find('\n')); }
 
 // Each read returns one record. EPIPE: the next record was overwritten meanwhile, and reading goes on after the gap.
-TFinding<TKernelLog> ReadDevice() {
-  TDevice const device;
-  if (device.Get() < 0) return WhyUnreadable(errno);
-  ::lseek(device.Get(), 0, SEEK_DATA);  // after the last clearing; otherwise reading begins at the oldest record
+TFinding<TKernelLog> ReadDevice(std::chrono::milliseconds limit) {
+  auto const end = std::chrono::steady_clock::now() + limit;
+  TUniqueFd const device(::open(kPath, O_RDONLY | O_NONBLOCK | O_CLOEXEC | O_NOCTTY));
+  if (!device) return WhyUnreadable(errno);
+  ::lseek(device.get(), 0, SEEK_DATA);  // after the last clearing; otherwise reading begins at the oldest record
   TCollector log;
   std::string buffer(8192, '\0');  // the kernel's longest record
-  std::size_t bytes = 0;
-  while (!log.IsFull() && bytes < kMostKernelBytes) {
-    ssize_t const size = ::read(device.Get(), buffer.data(), buffer.size());
+  while (std::chrono::steady_clock::now() < end) {
+    ssize_t const size = ::read(device.get(), buffer.data(), buffer.size());
     if (size > 0) {
       log.Add(FirstLine({buffer.data(), static_cast<std::size_t>(size)}));
-      bytes += static_cast<std::size_t>(size);
     } else if (size == 0 || errno == EAGAIN) {
       return log.Finish(true);
     } else if (errno != EPIPE && errno != EINTR) {
@@ -104,8 +89,8 @@ TFinding<TKernelLog> ReadDevice() {
 
 }  // namespace
 
-TFinding<TKernelLog> ReadKernelLog(TMachineFiles const& files) {
-  if (files.IsThisMachine()) return ReadDevice();
+TFinding<TKernelLog> ReadKernelLog(TMachineFiles const& files, std::chrono::milliseconds limit) {
+  if (files.IsThisMachine()) return ReadDevice(limit);
   auto const records = files.Content(kPath, kMostKernelBytes);
   if (!records && records.Why().fCode == kMissingNotGiven) return WhyUnreadable(ENOENT);
   return records.Then(KernelLogFrom);
@@ -113,12 +98,12 @@ TFinding<TKernelLog> ReadKernelLog(TMachineFiles const& files) {
 
 TKernelLog KernelLogFrom(std::string_view records) {
   TCollector log;
-  while (!records.empty() && !log.IsFull()) {
+  while (!records.empty()) {
     std::string_view const line = FirstLine(records);
     if (!line.empty() && line.front() != ' ') log.Add(line);
     records.remove_prefix(std::min(line.size() + 1, records.size()));
   }
-  return log.Finish(records.empty());
+  return log.Finish(true);
 }
 
 }  // namespace NQRVZEP20

@@ -16,7 +16,7 @@ constexpr std::uint64_t kMicro = 1000000;
 TFinding<std::uint64_t> RecordsOf(TKernelLog const& log) {
   if (log.fIsWhole) return log.fRecords;
   return TMissing{kMissingUnreadable,
-                  "the log has more than the " + std::to_string(log.fRecords + log.fUnreadable) + " records that are read"};
+                  "the time was up before the newest records were read; the oldest " + std::to_string(log.fRecords) + " were"};
 }
 
 TCIMDateTime TimeOf(TKernelMessage const& message, TRunningClock const& clock) {

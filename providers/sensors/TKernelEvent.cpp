@@ -57,7 +57,11 @@ std::string Cpu(TView text) { return "CPU " + Between(text, "CPU ", ":"); }
 std::string Device(TView text) { return Between(text, ", dev ", ","); }
 std::string BufferDevice(TView text) { return Between(text, " on dev ", ","); }
 std::string InParentheses(TView text) { return Between(text, "(", ")"); }
-std::string FileSystemDevice(TView text) { return Between(text, "(device ", ")"); }
+std::string MdDevice(TView text) { return Between(text, ": Disk failure on ", ","); }
+std::string FileSystemDevice(TView text) {
+  std::string const device = Between(text, "(device ", ")");
+  return device.substr(0, device.find(':'));  // BTRFS: "(device sda1: state EA)"
+}
 std::string Module(TView text) { return Between(text, " on ", " ("); }
 
 // A message: the text at its start and a text that it contains; either may be empty.
@@ -91,6 +95,8 @@ constexpr TPattern kPatterns[] = {
     {"NMI: IOCK error", "", TEvent::kHardware, TEvent::kCritical, None},
     {"", "I/O error, dev ", TEvent::kDisk, TEvent::kMajor, Device},
     {"", "critical medium error, dev ", TEvent::kDisk, TEvent::kMajor, Device},
+    {"", "critical target error, dev ", TEvent::kDisk, TEvent::kMajor, Device},
+    {"md/", ": Disk failure on ", TEvent::kDisk, TEvent::kMinor, MdDevice},
     {"Buffer I/O error on dev dm-", "", TEvent::kDisk, TEvent::kMajor, BufferDevice},
     {"Buffer I/O error on dev md", "", TEvent::kDisk, TEvent::kMajor, BufferDevice},
     {"nvme nvme", " timeout, ", TEvent::kDisk, TEvent::kMinor, SecondWord},
@@ -99,12 +105,25 @@ constexpr TPattern kPatterns[] = {
     {"EXT4-fs error (device ", "", TEvent::kFileSystem, TEvent::kMajor, FileSystemDevice},
     {"XFS (", "orruption", TEvent::kFileSystem, TEvent::kMajor, InParentheses},
     {"BTRFS critical (device ", "", TEvent::kFileSystem, TEvent::kMajor, FileSystemDevice},
+    {"BTRFS error (device ", " errs: ", TEvent::kFileSystem, TEvent::kMajor, FileSystemDevice},
+    {"BTRFS error (device ", "corrupt", TEvent::kFileSystem, TEvent::kMajor, FileSystemDevice},
+    {"BTRFS error (device ", "bad tree block", TEvent::kFileSystem, TEvent::kMajor, FileSystemDevice},
+    {"BTRFS error (device ", "transid verify failed", TEvent::kFileSystem, TEvent::kMajor, FileSystemDevice},
+    {"BTRFS error (device ", "unable to fixup", TEvent::kFileSystem, TEvent::kMajor, FileSystemDevice},
+    {"BTRFS error (device ", "ransaction aborted", TEvent::kFileSystem, TEvent::kMajor, FileSystemDevice},
+    {"BTRFS warning (device ", "csum failed", TEvent::kFileSystem, TEvent::kMajor, FileSystemDevice},
 };
 
 // Drives whose medium may be missing or removed report errors, although they work.
 bool IsRemovableMedium(TEvent const& event) {
   return event.fKind == TEvent::kDisk && (BeginsWith(event.fSubject, "sr") || BeginsWith(event.fSubject, "fd") ||
                                           Contains(event.fMessage.fText, ": failed command: PACKET"));
+}
+
+// Many disks refuse requests to forget blocks, and work well.
+bool IsRefusedDiscard(TEvent const& event) {
+  return event.fKind == TEvent::kDisk &&
+         (Contains(event.fMessage.fText, "(DISCARD)") || Contains(event.fMessage.fText, "(WRITE_ZEROES)"));
 }
 
 // A machine check that was found at the start may have ended the previous run. Bit 61 of the state of the bank is set for an
@@ -141,7 +160,7 @@ std::optional<TKernelEvent> KernelEventFrom(TKernelMessage message) {
     if (!BeginsWith(text, pattern.fBeginning) || !Contains(text, pattern.fPart)) continue;
     TEvent event{pattern.fKind, SeverityOf(pattern, text), pattern.fSubject(text), {}};
     event.fMessage = std::move(message);
-    return IsRemovableMedium(event) ? std::nullopt : std::optional(std::move(event));
+    return IsRemovableMedium(event) || IsRefusedDiscard(event) ? std::nullopt : std::optional(std::move(event));
   }
   return std::nullopt;
 }

@@ -42,7 +42,7 @@ TRoom const kRooms[] = {
     {"providers/host", {"include", "core", "loaders", "providers/memory", "providers/reasons", "platform/include"}},
     {"providers/storage", {"include", "providers/memory", "providers/reasons"}},
     {"providers/devices", {"include", "providers/memory", "providers/reasons"}},
-    {"providers/sensors", {"include", "providers/memory", "providers/reasons"}},
+    {"providers/sensors", {"include", "core", "providers/memory", "providers/reasons"}},
     {"providers/controller", {"include", "core", "providers/memory", "providers/reasons", "platform/include"}},
     {"providers/network", {"include", "providers/memory", "providers/reasons"}},
     {"collect", {"include", "core", "providers/memory", "providers/mof", "providers/reasons"}},

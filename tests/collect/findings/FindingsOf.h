@@ -37,6 +37,7 @@ inline constexpr char const* kRuleClasses = R"(
   class CIM_EthernetPort { [key] string DeviceID; uint16 EnabledState; uint16 OperationalStatus[]; boolean FullDuplex;
     uint64 Speed; uint64 MaxSpeed; };
   class CIM_IPProtocolEndpoint { [key] string Name; string InterfaceName; uint16 AddressOrigin; };
+  class ZEP_NetworkInterface { [key] string Name; string ElementName; uint16 EnabledState; };
   class ZEP_BridgePort { [key] string Name; string ElementName; };
   class ZEP_BondMember { [key] string Name; string ElementName; string BondName; string MIIStatus; };
   class ZEP_Bond { [key] string InstanceID; string ElementName; uint32 NumberOfMembers; };
@@ -55,7 +56,7 @@ inline constexpr char const* kRuleClasses = R"(
   class ZEP_PCIErrors { [key] string InstanceID; string ElementName; uint64 CorrectableErrors; uint64 NonFatalErrors;
     uint64 FatalErrors; };
   class CIM_PowerSupply { [key] string DeviceID; string ElementName; uint16 OperationalStatus[]; };
-  class ZEP_KernelLog { [key] string InstanceID; uint64 GoneRecords; };
+  class ZEP_KernelLog { [key] string InstanceID; uint64 CurrentNumberOfRecords; uint64 GoneRecords; uint64 LeftOutRecords; };
   class ZEP_KernelLogRecord { [key] string RecordID; string RecordData; uint16 PerceivedSeverity; uint16 Kind; string Subject;
     uint64 Age; };
   class CIM_Processor { [key] string DeviceID; string ElementName; string Stepping; };

@@ -60,6 +60,9 @@ TEST(LogRulesTest, ErrorsOfDisksAndFileSystemsAreNamed) {
 
 TEST(LogRulesTest, ADiskThatHasVanishedSinceIsAWarning) {
   std::string const disks = "instance of CIM_DiskDrive { DeviceID = \"sda\"; };";
+  EXPECT_THAT(Problems("disk-errors", disks + Record(1, kDisk, kMinor, "sda1", 60)),
+              ElementsAre("warning: the kernel reports an input or output error of the disk sda1, 1 minute ago (text 1)"))
+      << "a partition";
   EXPECT_THAT(Problems("disk-errors", disks + Record(1, kDisk, kMajor, "sda", 60) + Record(2, kDisk, kMajor, "sdb", 60)),
               ElementsAre("error: the kernel reports an input or output error of the disk sda, 1 minute ago (text 1)",
                           "warning: the kernel reports an input or output error of the disk sdb, which has vanished since, "
@@ -83,13 +86,22 @@ TEST(LogRulesTest, AProblemNamesTheNewestRecordAndARemedy) {
 }
 
 TEST(LogRulesTest, ALogWithoutErrorsIsFine) {
-  std::string const log = "instance of ZEP_KernelLog { InstanceID = \"ZEP:log:kernel\"; GoneRecords = 0; };";
-  for (char const* rule : {"out-of-memory", "hardware-errors", "disk-errors"}) EXPECT_EQ(Outcome(rule, log), "fine");
-  TRuleResult const result =
-      ResultOf("disk-errors", FindingsOf("instance of ZEP_KernelLog { InstanceID = \"ZEP:log:kernel\"; GoneRecords = 9; };"));
-  EXPECT_EQ(NameOf(result.fOutcome), "fine");
-  ASSERT_THAT(result.fNotAsked, testing::SizeIs(1));
-  EXPECT_EQ(result.fNotAsked.front().fReason, "older records of the log are gone: 9");
+  auto const log = [](char const* records, int gone, int leftOut) {
+    return std::string("instance of ZEP_KernelLog { InstanceID = \"ZEP:log:kernel\"; CurrentNumberOfRecords = ") + records +
+           "; GoneRecords = " + std::to_string(gone) + "; LeftOutRecords = " + std::to_string(leftOut) + "; };";
+  };
+  for (char const* rule : {"out-of-memory", "hardware-errors", "disk-errors"}) EXPECT_EQ(Outcome(rule, log("9", 0, 0)), "fine");
+  auto const notAsked = [](std::string const& instances) {
+    std::vector<std::string> reasons;
+    TRuleResult const result = ResultOf("disk-errors", FindingsOf(instances));
+    EXPECT_EQ(NameOf(result.fOutcome), "fine");
+    for (TNotAsked const& each : result.fNotAsked) reasons.push_back(each.fReason);
+    return reasons;
+  };
+  EXPECT_THAT(notAsked(log("9", 0, 0)), IsEmpty());
+  EXPECT_THAT(notAsked(log("9", 7, 0)), ElementsAre("older records of the log are gone: 7"));
+  EXPECT_THAT(notAsked(log("9", 0, 50)), ElementsAre("older records about errors were left out: 50"));
+  EXPECT_THAT(notAsked(log("NULL", 0, 0)), testing::SizeIs(1)) << "not all records were read";
   EXPECT_EQ(Outcome("disk-errors", Record(1, kOutOfMemory, kMajor, "tail", 10)), "fine");
 }
 

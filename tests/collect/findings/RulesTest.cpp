@@ -177,6 +177,25 @@ TEST(RulesTest, ABondWithoutAMemberIsNamed) {
               ElementsAre("warning: the bond bond0 has only one member"));
 }
 
+TEST(RulesTest, ABondOrAMemberThatIsSwitchedOffIsNotSentToItsCable) {
+  std::string const members = R"(
+      instance of ZEP_BondMember { Name = "1"; ElementName = "eth0"; BondName = "bond0"; MIIStatus = "down"; };
+      instance of ZEP_BondMember { Name = "2"; ElementName = "eth1"; BondName = "bond0"; MIIStatus = "up"; };
+      instance of ZEP_Bond { InstanceID = "bond0"; ElementName = "bond0"; NumberOfMembers = 2; };)";
+  auto const off = [](std::string const& name) {
+    return "instance of ZEP_NetworkInterface { Name = \"" + name + "\"; ElementName = \"" + name + "\"; EnabledState = 3; };";
+  };
+  EXPECT_THAT(Problems("bond-member", members + off("eth0")),
+              ElementsAre("error: the bond bond0 lacks its member eth0, which is switched off"));
+  EXPECT_EQ(FindingsOf(members + off("eth0")).fProblems.front().fRemedy, "Switch it on (ip link set dev eth0 up).");
+  EXPECT_THAT(Problems("bond-member", members + off("bond0")),
+              ElementsAre("warning: the bond bond0 is switched off, although it has members"));
+  EXPECT_THAT(Problems("bond-member", off("bond0") + R"(
+      instance of ZEP_Bond { InstanceID = "bond0"; ElementName = "bond0"; NumberOfMembers = 0; };)"),
+              IsEmpty())
+      << "as the kernel makes it when it loads the module";
+}
+
 // ---- Devices ----
 
 // A bridge with 16 lanes of 16 GT/s and the device below it.

@@ -72,12 +72,23 @@ TEST(KernelLogTest, GapsAndUnknownFormsAreCounted) {
   EXPECT_EQ(log.fUnreadable, 1u);
 }
 
-TEST(KernelLogTest, ALongLogIsReadInPart) {
+TEST(KernelLogTest, TheNewestErrorOfALongLogIsKept) {
   std::string records;
-  for (std::size_t number = 0; number <= kMostKernelRecords; ++number) records += "6,1,1,-;\n";
-  TKernelLog const log = KernelLogFrom(records);
-  EXPECT_EQ(log.fRecords, kMostKernelRecords);
-  EXPECT_FALSE(log.fIsWhole);
+  constexpr int many = 600000;
+  for (int number = 0; number < many; ++number) records += "6," + std::to_string(number) + ",1,-;\n";
+  TKernelLog const log = KernelLogFrom(records + DiskError(many));
+  EXPECT_EQ(log.fRecords, many + 1U);
+  EXPECT_TRUE(log.fIsWhole);
+  EXPECT_THAT(log.fEvents, SizeIs(1));
+}
+
+TEST(KernelLogTest, ALogThatTakesTooLongIsReadInPart) {
+  auto const log = ReadKernelLog(TMachineFiles("/"), std::chrono::seconds(0));
+  if (!log) {
+    EXPECT_NE(log.Why().fReason, "");
+    return;
+  }
+  EXPECT_FALSE(log->fIsWhole);
 }
 
 TEST(KernelLogTest, ARecordedMachineHasAFile) {

@@ -81,16 +81,32 @@ INSTANTIATE_TEST_SUITE_P(
         TRow{"EXT4-fs error (device dm-0): ext4_journal_check_start:83: comm ext4lazyinit: Detected aborted journal",
              TEvent::kFileSystem, TEvent::kMajor, "dm-0"},
         TRow{"XFS (sdb1): Metadata corruption detected at xfs_agf_read_verify+0x70/0x120", TEvent::kFileSystem, TEvent::kMajor,
-             "sdb1"}));
+             "sdb1"},
+        TRow{"critical target error, dev sdb, sector 4096 op 0x1:(WRITE) flags 0x8800", TEvent::kDisk, TEvent::kMajor, "sdb"},
+        TRow{"md/raid1:md0: Disk failure on sdb1, disabling device.\nmd/raid1:md0: Operation continuing on 1 devices.",
+             TEvent::kDisk, TEvent::kMinor, "sdb1"},
+        TRow{"BTRFS error (device sdb1): bdev /dev/sdb1 errs: wr 1, rd 0, flush 0, corrupt 0, gen 0", TEvent::kFileSystem,
+             TEvent::kMajor, "sdb1"},
+        TRow{"BTRFS error (device dm-0: state EA): Transaction aborted (error -5)", TEvent::kFileSystem, TEvent::kMajor, "dm-0"},
+        TRow{"BTRFS error (device sda2): parent transid verify failed on logical 5324800 mirror 1 wanted 9 found 7",
+             TEvent::kFileSystem, TEvent::kMajor, "sda2"},
+        TRow{"BTRFS error (device sda2): unable to fixup (regular) error at logical 20971520 on dev /dev/sda2",
+             TEvent::kFileSystem, TEvent::kMajor, "sda2"},
+        TRow{"BTRFS error (device sda2): bad tree block start, mirror 1 want 30408704 have 0", TEvent::kFileSystem,
+             TEvent::kMajor, "sda2"},
+        TRow{"BTRFS warning (device sda2): csum failed root 5 ino 257 off 0 csum 0x98f94189 expected csum 0x94b62931 mirror 1",
+             TEvent::kFileSystem, TEvent::kMajor, "sda2"}));
 
 TEST(KernelEventTest, OtherMessagesAreNoErrors) {
   for (char const* text :
        {"", "oom_reaper: reaped process 138 (tail)", "EXT4-fs (dm-0): mounted filesystem with ordered data mode.",
         "I/O error, dev sr0, sector 0 op 0x0:(READ)", "blk_update_request: I/O error, dev fd0, sector 0",
         "operation not supported error, dev loop0, sector 130944 op 0x9:(WRITE_ZEROES)",
-        "critical target error, dev sdb, sector 1 op 0x3:(DISCARD)", "ata2.00: failed command: PACKET",
-        "{1}[Hardware Error]: event severity: info", "EDAC MC: Ver: 3.0.0", "mce: [Hardware Error]: Machine check events logged",
-        "systemd[1]: Out of memory: Killed process 1 (a) "})
+        "critical target error, dev sdb, sector 1 op 0x3:(DISCARD)",
+        "blk_update_request: critical target error, dev sdb, sector 1 op 0x9:(WRITE_ZEROES) flags 0x400",
+        "BTRFS error (device sda2): unrecognized mount option 'foo'", "BTRFS info (device sda2): bdev /dev/sda2 errs: wr 1, rd 0",
+        "ata2.00: failed command: PACKET", "{1}[Hardware Error]: event severity: info", "EDAC MC: Ver: 3.0.0",
+        "mce: [Hardware Error]: Machine check events logged", "systemd[1]: Out of memory: Killed process 1 (a) "})
     EXPECT_FALSE(KernelEventFrom({0, 1, 2, text})) << text;
 }
 

@@ -139,7 +139,7 @@ TEST_F(FindingsTextTest, TheTextBeginsWithTheProblemsAndTheirRemedies) {
                               "             Replace the failed disk and add the new one (mdadm --add).\n"
                               "error        the file system on /data is full.\n"
                               "             Delete what is not needed, or enlarge the file system.\n"
-                              "error        the bond bond0 lacks its member eth0, which has no link.\n"));
+                              "error        the bond bond0 lacks its member eth0, which is switched off.\n"));
   EXPECT_LT(text.find("Findings:"), text.find("Identity"));
   EXPECT_THAT(Report("server").fOutput, HasSubstr("\nFindings: nothing wrong ("));
 }
