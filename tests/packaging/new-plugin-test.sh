@@ -38,6 +38,10 @@ readelf --wide --dynamic "$plugin" | grep -q 'Library runpath: \[\$ORIGIN\]' || 
 grep -q '^schema  *passed' "$work/log" || fail "its classes are not checked against the schema:" "$work/log"
 
 cmake --install project >"$work/log" || fail "it is not installed:" "$work/log"
+document=$work/prefix/share/zepcore/mof/Everything.mof
+"$zep" plugin check "$(dirname "$(find "$work/prefix" -name libzepcore.so)")/libEverything.nsp.so" --mof "$document" >"$work/log" 2>&1 ||
+  fail "the companion document does not describe the installed plug-in:" "$work/log"
+grep -q '^schema  *passed' "$work/log" || fail "the companion document is not read:" "$work/log"
 "$zep" report --sample >"$work/log" || true  # an incomplete report is not a failure here
 grep -q 'Everything .*root/everything' "$work/log" || fail "zep report does not list the plug-in:" "$work/log"
 "$zep" show X_Everything >"$work/log" || fail "zep show does not find the class:" "$work/log"
