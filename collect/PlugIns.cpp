@@ -50,11 +50,19 @@ TPlugIn Load(TPlugInFile const& file, std::string const& sampleLabel) {
   plugIn.fMilliseconds = failure.fMilliseconds;
   plugIn.fError = failure.ReasonOrMessage();
   if (!plugIn.fError.empty()) plugIn.fStage = NameOf(EStage::kOpen);
+  plugIn.fUndefinedSymbols = UndefinedSymbols(plugIn.fError, file.fFile);
 
   for (auto const& [providerName, provider] : RegisteredProviders())
     if (before.count(providerName) == 0) plugIn.fProviders.push_back(Fill(providerName, provider, sampleLabel));
   plugIn.fLogsDebug = LogsDebug() && !loggedDebug;
   return plugIn;
+}
+
+// The linker's message names the first one.
+std::string MessageOf(TPlugIn const& plugIn) {
+  std::string text = plugIn.fError;
+  for (std::size_t at = 1; at < plugIn.fUndefinedSymbols.size(); ++at) text += ", " + plugIn.fUndefinedSymbols[at];
+  return text;
 }
 
 // "kZEPStatusAccessDenied (fill, libTest.nsp.so); last log line: [Error] no disk". A line that repeats the error is left out.
@@ -108,7 +116,7 @@ std::vector<std::string> FailuresOf(std::vector<TPlugIn> const& plugIns) {
 }
 
 std::string FailurePhraseOf(TPlugIn const& plugIn) {
-  return Phrase(plugIn.fFile, plugIn.fError, plugIn.fStage, plugIn.fLastLogLine);
+  return Phrase(plugIn.fFile, MessageOf(plugIn), plugIn.fStage, plugIn.fLastLogLine);
 }
 
 std::string FailurePhraseOf(TPlugIn const& plugIn, TProviderRun const& run) {

@@ -54,6 +54,8 @@ struct TPlugIn {
   std::uint64_t fPeakBytes = 0;         // the highest growth of the memory during the load; 0 if not measured
   std::optional<TTraces> fTraces = {};  // none if not measured, or if the process ended too early
 
+  std::vector<std::string> fUndefinedSymbols = {};  // because of which it could not be loaded, as the linker names them
+
   bool fLogsDebug = false;                 // whether it has set the log threshold so that debug entries are logged
   EPlugInRule fRule = EPlugInRule::kNone;  // by which its file was passed over
 

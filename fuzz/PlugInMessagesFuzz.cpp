@@ -54,6 +54,11 @@ std::string ResultOf(std::string_view bytes, std::size_t pieceSize) {
   }
   if (plugIn.fLogsDebug) result += "logs debug\n";
   result += TextOf(plugIn.fTraces);
+  Require(plugIn.fUndefinedSymbols.size() <= kMostUndefinedSymbols);
+  for (std::string const& symbol : plugIn.fUndefinedSymbols) {
+    Require(symbol.size() <= kLongestName);
+    result += symbol + "\n";
+  }
   return result;
 }
 

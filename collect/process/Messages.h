@@ -26,6 +26,7 @@ enum class EMessage : unsigned char {
   kLeftRunning,  // a process that the plug-in leaves running: its number and name. Sent before kTraced
   kTraced,       // all descriptors and processes that the plug-in leaves have been sent
   kLogsDebug,    // the plug-in has set the log threshold so that debug entries are logged
+  kUndefined,    // a symbol that no library defines, because of which loading has failed: its name
   kDone          // nothing more follows; the last kind
 };
 

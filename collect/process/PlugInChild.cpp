@@ -200,6 +200,12 @@ TTimedFailure MeasuredFailureOf(bool isMeasured, TStep step) {
   return failure;
 }
 
+void SendUndefinedSymbols(std::string const& message, std::string const& file) {
+  std::vector<std::string> symbols = UndefinedSymbols(message, file);
+  symbols.resize(std::min<std::size_t>(symbols.size(), kMostUndefinedSymbols));
+  for (std::string const& symbol : symbols) Send(EMessage::kUndefined, symbol);
+}
+
 void Load(TChildSetup const& setup) {
   SendStage(EStage::kOpen);
   bool const runsItsCode = CanBeMapped(setup.fFile);
@@ -207,6 +213,7 @@ void Load(TChildSetup const& setup) {
   TTimedFailure const failure = MeasuredFailureOf(setup.fMeasures, [&] { LoadLibraryOf({setup.fName, setup.fFile}); });
   bool const isOfLinker = IsOfLinker(failure);
   if (isOfLinker) SendStage(EStage::kOpen);
+  if (isOfLinker) SendUndefinedSymbols(failure.fReason, setup.fFile);
   if (!failure.fMessage.empty()) Send(EMessage::kFailed, isOfLinker ? failure.fReason : failure.MessageAndReason());
   SendTime(EMessage::kLoaded, failure.fMilliseconds);
 }

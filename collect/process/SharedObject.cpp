@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/process/SharedObject.h"
 
+#include "TOSSpecific.h"
 #include "core/Handles.h"
 
 #include <cxxabi.h>
+#include <dlfcn.h>
 #include <fcntl.h>
 #include <link.h>
 #include <sys/stat.h>
@@ -15,6 +17,7 @@
 #include <cstring>
 #include <iterator>
 #include <memory>
+#include <sstream>
 
 namespace NQRVZEP20 {
 
@@ -100,6 +103,15 @@ std::string TextAt(std::vector<char> const& texts, std::size_t at) {
   return {begin, std::find(begin, end, '\0')};
 }
 
+// The symbol that a line of the dynamic linker names as undefined; empty if it names none. A version or a file may follow.
+std::string UndefinedSymbolIn(std::string const& line) {
+  std::string const words = "undefined symbol: ";
+  std::size_t const start = line.find(words);
+  if (start == line.npos) return "";
+  std::string const rest = line.substr(start + words.size());
+  return rest.substr(0, rest.find_first_of("\t,"));
+}
+
 }  // namespace
 
 bool CanBeMapped(std::string const& fileName) {
@@ -139,6 +151,21 @@ std::optional<std::vector<std::string>> ExportedSymbols(std::string const& fileN
     if (!IsOfLinker(text)) exported.push_back(text);
   }
   return exported;
+}
+
+std::vector<std::string> UndefinedSymbols(std::string const& message, std::string const& fileName) {
+  constexpr int kSeconds = 30;
+  std::vector<std::string> names = {UndefinedSymbolIn(message)};
+  if (names.front().empty()) return {};
+  std::string output;
+  TOSSpecific::SpawnProcess("ldd", {"-r", fileName}, output, kSeconds);
+  std::istringstream lines(output);
+  for (std::string line; std::getline(lines, line);) {
+    std::string const name = UndefinedSymbolIn(line);
+    bool const isKnown = name.empty() || std::find(names.begin(), names.end(), name) != names.end();
+    if (!isKnown && ::dlsym(RTLD_DEFAULT, name.c_str()) == nullptr) names.push_back(name);
+  }
+  return names;
 }
 
 std::string Demangled(std::string const& text) {

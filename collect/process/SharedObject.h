@@ -20,6 +20,11 @@ std::string WhyOfOtherProcessor(std::string const& fileName);
 // the linker adds to every library. None if the file cannot be mapped or has no such table. No code of the file runs.
 std::optional<std::vector<std::string>> ExportedSymbols(std::string const& fileName);
 
+// The names of all symbols that the shared object uses and that neither this process nor the libraries that the object needs
+// define. `message` is that of the dynamic linker, which names only the first one; if it is about anything else, the result is
+// empty. The program ldd finds the others; without it, the result is the first one. Blocks until ldd ends.
+std::vector<std::string> UndefinedSymbols(std::string const& message, std::string const& fileName);
+
 // The text with each mangled name of C++ in it, as the dynamic linker writes it, replaced by the name in the source.
 std::string Demangled(std::string const& text);
 

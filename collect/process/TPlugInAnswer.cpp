@@ -72,6 +72,8 @@ void TPlugInAnswer::Take(TMessage const& message) {
     case EMessage::kLogsDebug:
       fResult.fLogsDebug = true;
       return;
+    case EMessage::kUndefined:
+      return TakeUndefined(text);
     case EMessage::kDone:
       if (fProvider) Fail("its result ended before its namespace was complete");
       fState = EState::kDone;
@@ -138,6 +140,12 @@ void TPlugInAnswer::TakeTrace(TMessage const& message) {
   auto& traces = message.fKind == EMessage::kLeftOpen ? fTraces.fDescriptors : fTraces.fProcesses;
   if (traces.size() >= kMostTraces) return Refuse("it names more than " + std::to_string(kMostTraces) + " traces of a kind");
   traces.push_back(Shortened(message.fText, kLongestFailure));
+}
+
+void TPlugInAnswer::TakeUndefined(std::string const& symbol) {
+  if (fResult.fUndefinedSymbols.size() >= kMostUndefinedSymbols)
+    return Refuse("it names more than " + std::to_string(kMostUndefinedSymbols) + " undefined symbols");
+  fResult.fUndefinedSymbols.push_back(Shortened(symbol, kLongestName));
 }
 
 void TPlugInAnswer::Fail(std::string why, bool exceedsLimit) {

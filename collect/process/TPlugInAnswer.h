@@ -53,6 +53,7 @@ private:
   void TakeNamespace(std::string const& microseconds);
   void TakeCost(std::string const& bytes);
   void TakeTrace(TMessage const& message);
+  void TakeUndefined(std::string const& symbol);
   void EndFill();
   void Begin(EStage stage);
   void Refuse(std::string why);

@@ -252,6 +252,13 @@ TEST_F(TPlugInAnswerTest, AFailureBecauseOfALimitIsMarked) {
   EXPECT_TRUE(plugIn.fProviders.at(0).fExceedsLimit);
 }
 
+TEST_F(TPlugInAnswerTest, UndefinedSymbolsAreKeptUpToALimit) {
+  EXPECT_EQ(AnswerOf({{EMessage::kUndefined, "f"}, {EMessage::kUndefined, "g"}})->Finish("").fUndefinedSymbols,
+            (std::vector<std::string>{"f", "g"}));
+  EXPECT_EQ(AnswerOf(TMessages(kMostUndefinedSymbols + 1, {EMessage::kUndefined, "f"}))->WhyBad(),
+            "it names more than 1000 undefined symbols");
+}
+
 TEST_F(TPlugInAnswerTest, ALongFailureIsCut) {
   auto const answer = AnswerOf({{EMessage::kFailed, std::string(1022, 'x') + "\xc3\xa9 and more"}});
   EXPECT_EQ(answer->Finish("").fError, std::string(1021, 'x') + "...");

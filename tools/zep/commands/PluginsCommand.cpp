@@ -65,7 +65,7 @@ TCounts CountsOf(TPlugIn const& plugIn) {
 std::string RuleOf(TPlugIn const& plugIn) {
   auto const isOfTakenName = [](TProviderRun const& run) { return run.fStage == "registration"; };
   if (!plugIn.fError.empty() && !IsElfFile(plugIn.fFile)) return "format";
-  if (plugIn.fError.find("undefined symbol") != std::string::npos) return "undefined-symbol";
+  if (!plugIn.fUndefinedSymbols.empty()) return "undefined-symbol";
   if (!plugIn.fError.empty()) return "failed";
   if (plugIn.fProviders.empty()) return "registered-nothing";
   if (std::any_of(plugIn.fProviders.begin(), plugIn.fProviders.end(), isOfTakenName)) return "name-taken";

@@ -1,11 +1,22 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/output/PlugInRows.h"
 
+#include "collect/process/SharedObject.h"
 #include "tools/zep/secrets/Secrets.h"
 
 #include <cstdio>
 
 namespace NQRVZEP20::zep {
+
+namespace {
+
+TJson Readable(std::vector<std::string> const& symbols) {
+  TJson names = TJson::array();
+  for (std::string const& symbol : symbols) names.push_back(Demangled(symbol));
+  return names;
+}
+
+}  // namespace
 
 std::string ResultOf(TPlugIn const& plugIn) {
   if (!plugIn.fError.empty()) return "failed: " + MessageWithoutSecrets(FailurePhraseOf(plugIn));
@@ -37,9 +48,15 @@ TJson PlugInAsJson(TPlugIn const& plugIn) {
                          {"error", OrNull(provider.fError)},
                          {"stage", OrNull(provider.fStage)},
                          {"lastLogLine", OrNull(provider.fLastLogLine)}});
-  return {{"name", plugIn.fName},           {"file", plugIn.fFile},           {"milliseconds", plugIn.fMilliseconds},
-          {"error", OrNull(plugIn.fError)}, {"stage", OrNull(plugIn.fStage)}, {"lastLogLine", OrNull(plugIn.fLastLogLine)},
-          {"words", OrNull(plugIn.fWords)}, {"providers", providers}};
+  return {{"name", plugIn.fName},
+          {"file", plugIn.fFile},
+          {"milliseconds", plugIn.fMilliseconds},
+          {"error", OrNull(plugIn.fError)},
+          {"stage", OrNull(plugIn.fStage)},
+          {"lastLogLine", OrNull(plugIn.fLastLogLine)},
+          {"words", OrNull(plugIn.fWords)},
+          {"undefinedSymbols", Readable(plugIn.fUndefinedSymbols)},
+          {"providers", providers}};
 }
 
 TJson FailedPlugInsAsJson(std::vector<TPlugIn> const& plugIns) {

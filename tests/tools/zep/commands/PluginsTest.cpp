@@ -100,12 +100,19 @@ TEST_F(PluginsTest, APlugInThatFailsIsListedWithTheReason) {
               HasSubstr("zep: libTest.nsp.so: provider Test failed: kZEPStatusAccessDenied (fill, libTest.nsp.so)"));
 }
 
-TEST_F(PluginsTest, AnUndefinedSymbolIsNamed) {
+TEST_F(PluginsTest, EveryUndefinedSymbolIsNamed) {
+  std::vector<std::string> const symbols = {"AnotherThatIsMissing(int, char const*)", "SymbolThatIsMissing(int)",
+                                            "gObjectThatIsMissing"};
   fZep.Add("libLacks.nsp.so", LACKS_SYMBOL);
-  TRun const run = Run({"plugins", "--json"});
-  EXPECT_EQ(run.fStatus, 2);
-  EXPECT_EQ(EntryOf(JsonOf(run), "libLacks.nsp.so")["rule"], "undefined-symbol");
-  EXPECT_THAT(EntryOf(JsonOf(run), "libLacks.nsp.so")["reason"], HasSubstr("undefined symbol: SymbolThatIsMissing(int)"));
+  for (std::vector<std::string> const& arguments :
+       {std::vector<std::string>{"plugins", "--json"}, {"plugins", "--json", "--in-process"}}) {
+    TRun const run = Run(arguments);
+    EXPECT_EQ(run.fStatus, 2);
+    nlohmann::json const entry = EntryOf(JsonOf(run), "libLacks.nsp.so");
+    EXPECT_EQ(entry["rule"], "undefined-symbol");
+    EXPECT_THAT(entry["plugIn"]["undefinedSymbols"], testing::UnorderedElementsAreArray(symbols));
+    for (std::string const& symbol : symbols) EXPECT_THAT(entry["reason"], HasSubstr(symbol));
+  }
 }
 
 TEST_F(PluginsTest, APlugInForAnotherProcessorIsNamed) {

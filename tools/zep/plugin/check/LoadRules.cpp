@@ -17,8 +17,6 @@ namespace {
 
 namespace fs = std::filesystem;
 
-std::string const kUndefined = "undefined symbol: ";
-
 std::string FileNameOf(TObservation const& observation) { return fs::path(observation.fFile.fFile).filename().string(); }
 
 bool HasNameOfPlugIn(TObservation const& observation) { return observation.fFile.fName != FileNameOf(observation); }
@@ -31,9 +29,7 @@ std::string FailureIn(EStage stage, TObservation const& observation) {
   return plugIn.fStage == NameOf(stage) && !plugIn.fExceedsLimit ? Readable(plugIn.fError) : "";
 }
 
-bool LacksSymbol(TObservation const& observation) {
-  return FailureIn(EStage::kOpen, observation).find(kUndefined) != std::string::npos;
-}
+bool LacksSymbol(TObservation const& observation) { return !observation.fFirst.fPlugIn.fUndefinedSymbols.empty(); }
 
 // Whether the rule cannot be checked, which is then reported: the file is not loaded, or its load failed elsewhere. A failure
 // after the file has been opened does not concern the rules for opening it.
@@ -96,15 +92,11 @@ void CheckLoad(TObservation const& observation, TRuleResult& result) {
   result.Find(observation.fFile.fFile, "it cannot be loaded: " + failure);
 }
 
-// The dynamic linker resolves every symbol while it loads the file, and stops at the first one that it does not find.
 void CheckUndefinedSymbols(TObservation const& observation, TRuleResult& result) {
   if (CannotCheck(EStage::kOpen, observation, result)) return;
-  std::string const failure = FailureIn(EStage::kOpen, observation);
-  if (LacksSymbol(observation))
-    result.Find(failure.substr(failure.find(kUndefined) + kUndefined.size()), "no library defines this symbol",
-                "link the library that defines it (zep_add_provider, LIBS)");
-  else if (!failure.empty())
-    result.CannotCheck(observation.WhyNotLoaded());
+  for (std::string const& symbol : observation.fFirst.fPlugIn.fUndefinedSymbols)
+    result.Find(Readable(symbol), "no library defines this symbol", "link the library that defines it (zep_add_provider, LIBS)");
+  if (!result.HasFound() && !FailureIn(EStage::kOpen, observation).empty()) result.CannotCheck(observation.WhyNotLoaded());
 }
 
 void CheckExports(TObservation const& observation, TRuleResult& result) {
