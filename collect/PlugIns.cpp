@@ -31,12 +31,13 @@ TProviderRun Fill(std::string const& name, boost::shared_ptr<INamespaceProvider>
   TProviderRun run{name, {}, 0, ""};
   TTimedFailure const failure = TimedFailureOf([&] {
     auto const ns = provider->GetNamespace(TCIMContext());
-    if (!ns) throw std::runtime_error("it has no namespace");
+    if (!ns) throw std::runtime_error(kHasNoNamespace);
     run.fView = std::make_shared<TNamespaceView>(name, ns, sampleLabel);
   });
   run.fMilliseconds = failure.fMilliseconds;
   run.fError = failure.MessageAndReason();
   if (!run.fError.empty()) run.fStage = NameOf(EStage::kFill);
+  if (!run.fError.empty()) run.fCause = CauseOf(run.fError);
   return run;
 }
 

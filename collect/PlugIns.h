@@ -21,6 +21,14 @@ struct TClassCost {
   std::uint64_t fPeakBytes = 0;  // the highest growth of the memory meanwhile
 };
 
+// What happened to a plug-in or provider that failed, for programs. A part that does not apply is empty.
+struct TCause {
+  std::string fSignal = {};             // that killed its process: "SIGSEGV"
+  std::optional<int> fExitStatus = {};  // of its process, if it exited
+  std::string fException = {};          // the text of the exception that it threw
+  std::string fLimit = {};              // that it exceeded (ApartLimits.h): "time", "memory" or "size"
+};
+
 // The result of one provider that a plug-in registered.
 struct TProviderRun {
   std::string fName;
@@ -29,7 +37,7 @@ struct TProviderRun {
   std::string fError;                           // why the provider failed; empty when it succeeded
   std::string fStage = {};                      // the stage that failed: "registration" or "fill"; otherwise empty
   std::string fLastLogLine = {};                // the last before the failure: "[Error] no disk"; empty if unknown
-  bool fExceedsLimit = false;                   // whether it failed because of a limit (ApartLimits.h)
+  TCause fCause = {};                           // of the failure
   std::uint64_t fPeakBytes = 0;                 // the highest growth of the memory during the fill; 0 if not measured
   std::vector<TClassCost> fCosts = {};          // in the order of the enumeration; empty if not measured
 };
@@ -50,7 +58,7 @@ struct TPlugIn {
   std::string fStage = {};              // the stage that failed: "open", "static construction" or "registration"; otherwise empty
   std::string fLastLogLine = {};        // the last before the failure; empty if unknown
   std::string fWords = {};              // its printed output, without the middle if it is long; empty if unknown
-  bool fExceedsLimit = false;           // whether it failed because of a limit (ApartLimits.h)
+  TCause fCause = {};                   // of the failure
   std::uint64_t fPeakBytes = 0;         // the highest growth of the memory during the load; 0 if not measured
   std::optional<TTraces> fTraces = {};  // none if not measured, or if the process ended too early
 

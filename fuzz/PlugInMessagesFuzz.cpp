@@ -41,7 +41,7 @@ std::string ResultOf(std::string_view bytes, std::size_t pieceSize) {
   TPlugInAnswer answer("Fuzz", "libFuzz.nsp.so", limits, "", [] { return ""; });
   for (; !bytes.empty(); bytes.remove_prefix(std::min(pieceSize, bytes.size()))) answer.Add(bytes.substr(0, pieceSize));
   Require((answer.State() == TPlugInAnswer::EState::kBad) == !answer.WhyBad().empty());
-  if (answer.State() != TPlugInAnswer::EState::kDone) answer.Fail("it ended");
+  if (answer.State() != TPlugInAnswer::EState::kDone) answer.Fail({"it ended"});
 
   TPlugIn const plugIn = answer.Finish("");
   std::string result = Row(plugIn.fName, plugIn.fError, plugIn.fStage);

@@ -4,6 +4,7 @@
 #include "TLogger.h"
 #include "TRootObject.h"
 #include "collect/PlugInFiles.h"
+#include "collect/answer/AnswerLimits.h"
 #include "collect/answer/NamespaceBytes.h"
 #include "collect/process/Costs.h"
 #include "collect/process/Descriptors.h"
@@ -105,7 +106,7 @@ void OnExit(int status, void*) {
   TTimedFailure failure;
   if (thrown) failure = TimedFailureOf([&] { std::rethrow_exception(thrown); });
   FlushWords();
-  Send(EMessage::kFatal, thrown ? failure.MessageAndReason() : "it called std::terminate");
+  Send(EMessage::kFatal, thrown ? failure.MessageAndReason() : kCalledTerminate);
   ::_exit(1);
 }
 
@@ -235,7 +236,7 @@ void Fill(std::string const& name, INamespaceProvider& provider, bool isMeasured
   boost::shared_ptr<ICIMNamespace> ns;
   TTimedFailure failure = MeasuredFailureOf(isMeasured, [&] {
     ns = provider.GetNamespace(TCIMContext());
-    if (!ns) throw std::runtime_error("it has no namespace");
+    if (!ns) throw std::runtime_error(kHasNoNamespace);
   });
   double const milliseconds = failure.fMilliseconds;
   if (failure.fMessage.empty()) failure = TimedFailureOf([&] { Serialise(*ns, isMeasured); });

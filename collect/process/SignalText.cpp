@@ -5,11 +5,14 @@
 
 namespace NQRVZEP20 {
 
-std::string SignalText(int signal) {
+std::string SignalName(int signal) {
   char const* const name = ::sigabbrev_np(signal);
+  return name != nullptr ? "SIG" + std::string(name) : "signal " + std::to_string(signal);
+}
+
+std::string SignalText(int signal) {
   char const* const text = ::sigdescr_np(signal);
-  if (name == nullptr || text == nullptr) return "signal " + std::to_string(signal);
-  return "SIG" + std::string(name) + " (" + text + ")";
+  return SignalName(signal) + (text != nullptr ? " (" + std::string(text) + ")" : "");
 }
 
 }  // namespace NQRVZEP20

@@ -5,6 +5,7 @@
 #include "collect/SafeText.h"
 #include "collect/answer/TReceivedNamespace.h"
 #include "collect/process/Costs.h"
+#include "collect/process/TimedFailure.h"
 
 #include <algorithm>
 #include <charconv>
@@ -54,13 +55,12 @@ void TPlugInAnswer::Take(TMessage const& message) {
     case EMessage::kFilled:
       return TakeNamespace(text);
     case EMessage::kFailed:
-      return Fail(text);
+      return Fail({text, fStage == EStage::kOpen ? TCause() : CauseOf(text)});
     case EMessage::kFatal:
-      fEnding = text;
+      fEnding = {text, CauseOf(text)};
       return;
     case EMessage::kExits:
-      fEnding = "it exited with status " + text;
-      return;
+      return TakeExit(text);
     case EMessage::kCost:
       return TakeCost(text);
     case EMessage::kLeftOpen:
@@ -75,7 +75,7 @@ void TPlugInAnswer::Take(TMessage const& message) {
     case EMessage::kUndefined:
       return TakeUndefined(text);
     case EMessage::kDone:
-      if (fProvider) Fail("its result ended before its namespace was complete");
+      if (fProvider) Fail({"its result ended before its namespace was complete"});
       fState = EState::kDone;
       return;
   }
@@ -107,7 +107,7 @@ void TPlugInAnswer::TakeLoaded(std::string const& microseconds) {
 void TPlugInAnswer::TakeClasses() {
   if (!fNamespace) return;
   std::string const failure = FailureOf([&] { fNamespace->ReadClasses(); });
-  if (!failure.empty()) Fail(failure);
+  if (!failure.empty()) Fail({failure});
 }
 
 void TPlugInAnswer::TakeNamespace(std::string const& microseconds) {
@@ -117,7 +117,7 @@ void TPlugInAnswer::TakeNamespace(std::string const& microseconds) {
   run->fMilliseconds = *milliseconds;
   std::string const failure =
       FailureOf([&] { run->fView = std::make_shared<TNamespaceView>(run->fName, fNamespace->Finish(), fSampleLabel); });
-  if (!failure.empty()) Fail(failure);
+  if (!failure.empty()) Fail({failure});
   EndFill();
 }
 
@@ -148,15 +148,26 @@ void TPlugInAnswer::TakeUndefined(std::string const& symbol) {
   fResult.fUndefinedSymbols.push_back(Shortened(symbol, kLongestName));
 }
 
-void TPlugInAnswer::Fail(std::string why, bool exceedsLimit) {
+// The status of a process is the lowest byte of what the plug-in passed to exit.
+void TPlugInAnswer::TakeExit(std::string const& status) {
+  fEnding = {"it exited with status " + status};
+  int number = 0;
+  if (std::from_chars(status.data(), status.data() + status.size(), number).ec == std::errc())
+    fEnding->fCause.fExitStatus = number & 0xff;
+}
+
+void TPlugInAnswer::Fail(TPlugInFailure failure) {
   if (!fProvider && !fResult.fError.empty()) return;
+  auto& [why, cause] = failure;
   if (why.empty()) why = "it failed without a reason";
   bool const isOutOfMemory = fLimits.fMemoryMebibytes != 0 && why.find("std::bad_alloc") != why.npos;
+  if (isOutOfMemory) cause.fLimit = "memory";
   if (isOutOfMemory) why += " (the memory limit is " + std::to_string(fLimits.fMemoryMebibytes) + " MiB)";
   TProviderRun* const run = CurrentRun();
   (run != nullptr ? run->fError : fResult.fError) = Shortened(why, kLongestFailure);
   (run != nullptr ? run->fStage : fResult.fStage) = NameOf(run != nullptr ? EStage::kFill : fStage);
-  (run != nullptr ? run->fExceedsLimit : fResult.fExceedsLimit) = exceedsLimit || isOutOfMemory;
+  cause.fException = Shortened(cause.fException, kLongestFailure);
+  (run != nullptr ? run->fCause : fResult.fCause) = std::move(cause);
   (run != nullptr ? run->fLastLogLine : fResult.fLastLogLine) = fLastLogLine();
   if (run != nullptr) EndFill();
 }

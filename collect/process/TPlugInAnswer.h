@@ -16,6 +16,12 @@
 
 namespace NQRVZEP20 {
 
+// How a plug-in, or the filling of a namespace, has failed.
+struct TPlugInFailure {
+  std::string fWhy;
+  TCause fCause = {};
+};
+
 // The answer of a plug-in: the messages of its process (Messages.h) become its result. They may be any bytes: the first one that
 // is wrong, or exceeds a limit (AnswerLimits.h), ends the answer, and what was complete before remains.
 class TPlugInAnswer {
@@ -36,11 +42,11 @@ public:
   TClock::time_point StageBegan() const { return fStageBegan; }
 
   // How the plug-in announced the end of its process: an exception or the status that it passed to exit.
-  std::optional<std::string> const& Ending() const { return fEnding; }
+  std::optional<TPlugInFailure> const& Ending() const { return fEnding; }
 
   // The failure of the provider that is filling its namespace, or else of the plug-in, of which the first one counts. A long text
-  // is cut. `exceedsLimit`: whether the cause is a limit (ApartLimits.h).
-  void Fail(std::string why, bool exceedsLimit = false);
+  // is cut.
+  void Fail(TPlugInFailure failure);
 
   // Ends the answer. Providers whose namespace was not filled have failed.
   TPlugIn Finish(std::string words);
@@ -50,6 +56,7 @@ private:
   void TakeName(TMessage const& message);
   void TakeLoaded(std::string const& microseconds);
   void TakeClasses();
+  void TakeExit(std::string const& status);
   void TakeNamespace(std::string const& microseconds);
   void TakeCost(std::string const& bytes);
   void TakeTrace(TMessage const& message);
@@ -81,7 +88,7 @@ private:
   TClock::time_point fStageBegan = TClock::now();
   std::optional<std::string> fProvider;  // that is filling its namespace
   bool fHasLoaded = false;
-  std::optional<std::string> fEnding;
+  std::optional<TPlugInFailure> fEnding;
 };
 
 }  // namespace NQRVZEP20

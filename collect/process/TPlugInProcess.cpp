@@ -50,6 +50,25 @@ pid_t ForkOrThrow() {
   return child;
 }
 
+TPlugInFailure Exceeded(std::string limit, std::string why) {
+  TPlugInFailure failure{std::move(why)};
+  failure.fCause.fLimit = std::move(limit);
+  return failure;
+}
+
+// `status`: as waitpid returns it.
+TPlugInFailure EndOf(int status) {
+  TPlugInFailure failure;
+  if (WIFEXITED(status)) {
+    failure.fWhy = "it exited with status " + std::to_string(WEXITSTATUS(status));
+    failure.fCause.fExitStatus = WEXITSTATUS(status);
+  } else {
+    failure.fWhy = "it was killed by " + SignalText(WTERMSIG(status));
+    failure.fCause.fSignal = SignalName(WTERMSIG(status));
+  }
+  return failure;
+}
+
 bool HasInput(int fd, std::chrono::milliseconds wait) {
   pollfd waiting{fd, POLLIN, 0};
   return ::poll(&waiting, 1, static_cast<int>(wait.count())) > 0;
@@ -222,8 +241,7 @@ void TPlugInProcess::Complete() {
   fAnswerEnd.reset();
   ReadWords();
   ReadLog();
-  bool const exceedsLimit = fEnding == EEnding::kTimeUp || fEnding == EEnding::kTooLong;
-  if (fEnding != EEnding::kDone || fHasStoppedSupervisor) fAnswer.Fail(WhyDead(), exceedsLimit);
+  if (fEnding != EEnding::kDone || fHasStoppedSupervisor) fAnswer.Fail(WhyDead());
   fResult = fAnswer.Finish(fWords.Get());
   fHasEnded = true;
 }
@@ -238,21 +256,21 @@ void TPlugInProcess::EndSupervisor() {
   fSupervisor = -1;
 }
 
-std::string TPlugInProcess::WhyDead() const {
+TPlugInFailure TPlugInProcess::WhyDead() const {
   std::string const stopped = "has stopped its supervisor process";
   if (fEnding == EEnding::kTimeUp)
-    return "it exceeded the time limit of " + std::to_string(fLimits.fTimeoutSeconds) + " s" +
-           (fHasStoppedSupervisor ? ", and " + stopped : "");
-  if (fHasStoppedSupervisor) return "it " + stopped;
-  if (fEnding == EEnding::kTooLong) return "its result exceeds " + std::to_string(fLimits.fAnswerBytes) + " bytes";
-  if (fEnding == EEnding::kBadAnswer) return "its result is invalid: " + fAnswer.WhyBad();
+    return Exceeded("time", "it exceeded the time limit of " + std::to_string(fLimits.fTimeoutSeconds) + " s" +
+                                (fHasStoppedSupervisor ? ", and " + stopped : ""));
+  if (fHasStoppedSupervisor) return {"it " + stopped};
+  if (fEnding == EEnding::kTooLong)
+    return Exceeded("size", "its result exceeds " + std::to_string(fLimits.fAnswerBytes) + " bytes");
+  if (fEnding == EEnding::kBadAnswer) return {"its result is invalid: " + fAnswer.WhyBad()};
   if (fAnswer.Ending()) return *fAnswer.Ending();
-  if (!fVerdict) return "its supervisor process died";
+  if (!fVerdict) return {"its supervisor process died"};
   if (fVerdict->fStartFailure != 0)
-    return "no process could be started for it: " + std::generic_category().message(fVerdict->fStartFailure);
-  if (fEnding == EEnding::kClosed && !fVerdict->fHadEndedByItself) return "it closed the descriptor for its result";
-  if (WIFEXITED(fVerdict->fStatus)) return "it exited with status " + std::to_string(WEXITSTATUS(fVerdict->fStatus));
-  return "it was killed by " + SignalText(WTERMSIG(fVerdict->fStatus));
+    return {"no process could be started for it: " + std::generic_category().message(fVerdict->fStartFailure)};
+  if (fEnding == EEnding::kClosed && !fVerdict->fHadEndedByItself) return {"it closed the descriptor for its result"};
+  return EndOf(fVerdict->fStatus);
 }
 
 }  // namespace NQRVZEP20

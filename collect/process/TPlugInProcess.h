@@ -73,7 +73,7 @@ private:
   void CheckDeadlines();
   void Complete();
   void EndSupervisor();
-  std::string WhyDead() const;
+  TPlugInFailure WhyDead() const;
 
   TApartLimits const fLimits;
   TPlugIn fResult;  // only names until the end

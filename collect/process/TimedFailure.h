@@ -3,11 +3,23 @@
 
 #include "TZEPFailure.h"
 #include "collect/FailureOf.h"
+#include "collect/PlugIns.h"
 
 #include <chrono>
 #include <string>
 
 namespace NQRVZEP20 {
+
+// Failures of a plug-in that are not the text of an exception.
+constexpr char kHasNoNamespace[] = "it has no namespace";
+constexpr char kCalledTerminate[] = "it called std::terminate";
+
+// The cause of such a failure, or of one whose text is that of an exception.
+inline TCause CauseOf(std::string const& failure) {
+  TCause cause;
+  if (failure != kHasNoNamespace && failure != kCalledTerminate) cause.fException = failure;
+  return cause;
+}
 
 // Why a piece of work failed. Both strings are empty if it succeeded; the reason is also empty if the exception has none.
 struct TTimedFailure {

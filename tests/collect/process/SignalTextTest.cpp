@@ -12,6 +12,8 @@ TEST(SignalTextTest, ASignalHasItsNameAndDescription) {
   EXPECT_EQ(SignalText(SIGSEGV), "SIGSEGV (Segmentation fault)");
   EXPECT_EQ(SignalText(SIGKILL), "SIGKILL (Killed)");
   EXPECT_EQ(SignalText(1000), "signal 1000");
+  EXPECT_EQ(SignalName(SIGSEGV), "SIGSEGV");
+  EXPECT_EQ(SignalName(1000), "signal 1000");
 }
 
 }  // namespace

@@ -244,12 +244,14 @@ TEST_F(TPlugInAnswerTest, MeasurementsThatAreWrongOrWithoutEndAreRefused) {
 
 TEST_F(TPlugInAnswerTest, AFailureBecauseOfALimitIsMarked) {
   auto const plain = AnswerOf({{EMessage::kFailed, "no disk"}});
-  EXPECT_FALSE(plain->Finish("").fExceedsLimit);
+  EXPECT_EQ(plain->Finish("").fCause.fLimit, "");
   auto const late = AnswerOf({{EMessage::kFilling, "A"}});
-  late->Fail("too late", true);
+  TPlugInFailure tooLate{"too late"};
+  tooLate.fCause.fLimit = "time";
+  late->Fail(tooLate);
   TPlugIn const plugIn = late->Finish("");
-  EXPECT_FALSE(plugIn.fExceedsLimit);
-  EXPECT_TRUE(plugIn.fProviders.at(0).fExceedsLimit);
+  EXPECT_EQ(plugIn.fCause.fLimit, "");
+  EXPECT_EQ(plugIn.fProviders.at(0).fCause.fLimit, "time");
 }
 
 TEST_F(TPlugInAnswerTest, UndefinedSymbolsAreKeptUpToALimit) {
@@ -265,9 +267,13 @@ TEST_F(TPlugInAnswerTest, ALongFailureIsCut) {
 }
 
 TEST_F(TPlugInAnswerTest, TheAnnouncedEndIsKnown) {
-  EXPECT_EQ(AnswerOf({{EMessage::kExits, "7"}})->Ending(), "it exited with status 7");
-  EXPECT_EQ(AnswerOf({{EMessage::kFatal, "no disk"}})->Ending(), "no disk");
+  EXPECT_EQ(AnswerOf({{EMessage::kExits, "7"}})->Ending()->fWhy, "it exited with status 7");
+  EXPECT_EQ(AnswerOf({{EMessage::kFatal, "no disk"}})->Ending()->fWhy, "no disk");
   EXPECT_FALSE(AnswerOf({})->Ending());
+  EXPECT_EQ(AnswerOf({{EMessage::kExits, "263"}})->Ending()->fCause.fExitStatus, 7);
+  EXPECT_EQ(AnswerOf({{EMessage::kExits, "x"}})->Ending()->fCause.fExitStatus, std::nullopt);
+  EXPECT_EQ(AnswerOf({{EMessage::kFatal, "no disk"}})->Ending()->fCause.fException, "no disk");
+  EXPECT_EQ(AnswerOf({{EMessage::kFatal, "it called std::terminate"}})->Ending()->fCause.fException, "");
 }
 
 }  // namespace

@@ -16,6 +16,19 @@ TJson Readable(std::vector<std::string> const& symbols) {
   return names;
 }
 
+// Adds the members that are null unless the plug-in or provider has failed.
+template <class TFailed>
+void AddFailure(TJson& row, TFailed const& failed) {
+  TCause const& cause = failed.fCause;
+  row["error"] = OrNull(failed.fError);
+  row["stage"] = OrNull(failed.fStage);
+  row["signal"] = OrNull(cause.fSignal);
+  row["exitStatus"] = cause.fExitStatus ? TJson(*cause.fExitStatus) : TJson(nullptr);
+  row["exception"] = OrNull(cause.fException);
+  row["limit"] = OrNull(cause.fLimit);
+  row["lastLogLine"] = OrNull(failed.fLastLogLine);
+}
+
 }  // namespace
 
 std::string ResultOf(TPlugIn const& plugIn) {
@@ -41,22 +54,18 @@ std::string TimeTextOf(TPlugIn const& plugIn) {
 
 TJson PlugInAsJson(TPlugIn const& plugIn) {
   TJson providers = TJson::array();
-  for (TProviderRun const& provider : plugIn.fProviders)
-    providers.push_back({{"name", provider.fName},
-                         {"namespace", provider.fView ? TJson(provider.fView->GetName()) : TJson(nullptr)},
-                         {"milliseconds", provider.fMilliseconds},
-                         {"error", OrNull(provider.fError)},
-                         {"stage", OrNull(provider.fStage)},
-                         {"lastLogLine", OrNull(provider.fLastLogLine)}});
-  return {{"name", plugIn.fName},
-          {"file", plugIn.fFile},
-          {"milliseconds", plugIn.fMilliseconds},
-          {"error", OrNull(plugIn.fError)},
-          {"stage", OrNull(plugIn.fStage)},
-          {"lastLogLine", OrNull(plugIn.fLastLogLine)},
-          {"words", OrNull(plugIn.fWords)},
-          {"undefinedSymbols", Readable(plugIn.fUndefinedSymbols)},
-          {"providers", providers}};
+  for (TProviderRun const& provider : plugIn.fProviders) {
+    TJson const ns = provider.fView ? TJson(provider.fView->GetName()) : TJson(nullptr);
+    TJson row = {{"name", provider.fName}, {"namespace", ns}, {"milliseconds", provider.fMilliseconds}};
+    AddFailure(row, provider);
+    providers.push_back(row);
+  }
+  TJson row = {{"name", plugIn.fName}, {"file", plugIn.fFile}, {"milliseconds", plugIn.fMilliseconds}};
+  AddFailure(row, plugIn);
+  row["undefinedSymbols"] = Readable(plugIn.fUndefinedSymbols);
+  row["words"] = OrNull(plugIn.fWords);
+  row["providers"] = providers;
+  return row;
 }
 
 TJson FailedPlugInsAsJson(std::vector<TPlugIn> const& plugIns) {

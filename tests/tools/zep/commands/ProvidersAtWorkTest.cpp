@@ -25,8 +25,10 @@ TEST_F(ProvidersAtWorkTest, PlugInsThatHangOrStopAreEndedAtTheTimeLimit) {
   fZep.Remove("libHost.nsp.so");
   Add({"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs", "IsTraced", "SaysLoaded"});
   auto const document = JsonOf(Run({"report", "--json", "--plugin-timeout", "6"}));
-  for (char const* name : {"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs", "IsTraced", "SaysLoaded"})
+  for (char const* name : {"Hangs", "HangsBlocked", "Stops", "LoadHangs", "RegistrationHangs", "IsTraced", "SaysLoaded"}) {
     EXPECT_EQ(FailureIn(document, name)["error"], "it exceeded the time limit of 6 s") << name;
+    EXPECT_EQ(FailureIn(document, name)["limit"], "time") << name;
+  }
   EXPECT_EQ(FailureIn(document, "LoadHangs")["stage"], "static construction");
   EXPECT_EQ(FailureIn(document, "RegistrationHangs")["stage"], "registration");
   ExpectNoProcess("Hangs");
@@ -110,6 +112,8 @@ TEST_F(ProvidersAtWorkTest, APlugInThatFillsMemoryIsEndedAtTheMemoryLimit) {
   TRun const run = Run({"report", "--json", "--plugin-memory", "64"});
   EXPECT_EQ(run.fStatus, 2);
   EXPECT_EQ(FailureIn(JsonOf(run), "FillsMemory")["error"], "std::bad_alloc (the memory limit is 64 MiB)");
+  EXPECT_EQ(FailureIn(JsonOf(run), "FillsMemory")["limit"], "memory");
+  EXPECT_EQ(FailureIn(JsonOf(run), "FillsMemory")["exception"], "std::bad_alloc");
 }
 
 TEST_F(ProvidersAtWorkTest, AnEndlessAnswerIsCutOff) {
@@ -117,6 +121,7 @@ TEST_F(ProvidersAtWorkTest, AnEndlessAnswerIsCutOff) {
   TRun const run = Run({"report", "--json"});
   EXPECT_EQ(run.fStatus, 2);
   EXPECT_EQ(FailureIn(JsonOf(run), "AnswersForever")["error"], "its result exceeds 268435456 bytes");
+  EXPECT_EQ(FailureIn(JsonOf(run), "AnswersForever")["limit"], "size");
 }
 
 // ---- Interrupts and the terminal ----

@@ -112,6 +112,37 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
   ExpectNoProcess("KillsItsSupervisor");
 }
 
+TEST_F(ProvidersTest, TheDocumentsHaveTheCauseOfAFailureAsFields) {
+  struct TRow {
+    char const* fName;
+    nlohmann::json fSignal, fExitStatus, fException;
+  } const rows[] = {
+      {"Crashes", "SIGSEGV", nullptr, nullptr},
+      {"LoadAborts", "SIGABRT", nullptr, nullptr},
+      {"Exits", nullptr, 0, nullptr},
+      {"ExitsAtOnce", nullptr, 7, nullptr},
+      {"Throws", nullptr, nullptr, "kZEPStatusAccessDenied (no disk)"},
+      {"LoadThrows", nullptr, nullptr, "no disk today"},
+      {"ThrowsInAThread", nullptr, nullptr, "in a thread"},
+      {"Terminates", nullptr, nullptr, nullptr},
+      {"HasNoNamespace", nullptr, nullptr, nullptr},
+  };
+  for (TRow const& row : rows) Add({row.fName});
+  auto const document = JsonOf(Run({"report", "--json"}));
+  auto const files = JsonOf(Run({"plugins", "--json"}));
+  nlohmann::json plugIns;
+  for (auto const& file : files["files"])
+    if (!file["plugIn"].is_null()) plugIns["plugIns"].push_back(file["plugIn"]);
+  for (TRow const& row : rows)
+    for (auto const& failure : {FailureIn(document, row.fName), FailureIn(plugIns, row.fName)}) {
+      SCOPED_TRACE(row.fName);
+      EXPECT_EQ(failure["signal"], row.fSignal);
+      EXPECT_EQ(failure["exitStatus"], row.fExitStatus);
+      EXPECT_EQ(failure["exception"], row.fException);
+      EXPECT_TRUE(failure["limit"].is_null());
+    }
+}
+
 // The healthy plug-in is at work when the other one fails.
 TEST_F(ProvidersTest, AFailureThatIsHardToReportLeavesOtherPlugInsAlone) {
   struct TRow {

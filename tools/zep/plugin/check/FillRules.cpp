@@ -28,7 +28,7 @@ void CheckFill(TObservation const& observation, TRuleResult& result) {
   if (trial.fPlugIn.fProviders.empty()) return result.CannotCheck("no provider is registered");
   if (!trial.fPlugIn.fError.empty()) result.Find("after the fill", MessageWithoutSecrets(trial.fPlugIn.fError));
   for (TProviderRun const& run : trial.fPlugIn.fProviders)
-    if (run.fStage == NameOf(EStage::kFill) && !run.fExceedsLimit) result.Find(PlaceOf(run), FailureOfRun(run));
+    if (run.fStage == NameOf(EStage::kFill) && run.fCause.fLimit.empty()) result.Find(PlaceOf(run), FailureOfRun(run));
   for (TContent const& content : trial.fContents)
     for (TIssue const& failure : content.fFailures) result.Find(failure.fPlace, failure.fText);
 }
@@ -36,9 +36,9 @@ void CheckFill(TObservation const& observation, TRuleResult& result) {
 void CheckTimeAndMemory(TObservation const& observation, TRuleResult& result) {
   TPlugIn const& plugIn = observation.fFirst.fPlugIn;
   std::string const remedy = "do less work, or state in its documentation which --plugin-timeout or --plugin-memory it needs";
-  if (plugIn.fExceedsLimit) result.Find(plugIn.fStage, MessageWithoutSecrets(plugIn.fError), remedy);
+  if (!plugIn.fCause.fLimit.empty()) result.Find(plugIn.fStage, MessageWithoutSecrets(plugIn.fError), remedy);
   for (TProviderRun const& run : plugIn.fProviders)
-    if (run.fExceedsLimit) result.Find(PlaceOf(run) + ", " + run.fStage, FailureOfRun(run), remedy);
+    if (!run.fCause.fLimit.empty()) result.Find(PlaceOf(run) + ", " + run.fStage, FailureOfRun(run), remedy);
   if (!result.HasFound() && !observation.WhyNoContent().empty()) result.CannotCheck(observation.WhyNoContent());
 }
 

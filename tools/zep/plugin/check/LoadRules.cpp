@@ -26,7 +26,7 @@ std::string Readable(std::string const& error) { return MessageWithoutSecrets(De
 // The failure of the load in that stage, unless a limit is its cause; empty when there is none.
 std::string FailureIn(EStage stage, TObservation const& observation) {
   TPlugIn const& plugIn = observation.fFirst.fPlugIn;
-  return plugIn.fStage == NameOf(stage) && !plugIn.fExceedsLimit ? Readable(plugIn.fError) : "";
+  return plugIn.fStage == NameOf(stage) && plugIn.fCause.fLimit.empty() ? Readable(plugIn.fError) : "";
 }
 
 bool LacksSymbol(TObservation const& observation) { return !observation.fFirst.fPlugIn.fUndefinedSymbols.empty(); }
