@@ -125,6 +125,7 @@ TTestWithoutSource const kTestsWithoutSource[] = {
     {"providers/memory/NamespaceCopyTest.cpp", "the complete room, through the interfaces alone"},
     {"providers/mof/DeepInheritanceTest.cpp", "the complete room, with large texts"},
     {"providers/mof/DmtfSchemaTest.cpp", "the complete room, with a real schema"},
+    {"providers/storage/ChainTest.cpp", "the complete plug-in, through the interfaces alone"},
     {"proxy/DhcpParserTest.cpp", "the part of AutoProxyDiscovery that needs no network"},
     {"tools/zep/commands/ArgumentsTest.cpp", "every command of zep: its arguments"},
     {"tools/zep/commands/EnvelopeTest.cpp", "every command of zep: its exit status and document"},

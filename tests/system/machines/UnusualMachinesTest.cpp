@@ -8,6 +8,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <sched.h>
+#include <sys/mount.h>
+
 #include <algorithm>
 #include <set>
 
@@ -153,6 +156,28 @@ TEST_F(UnusualMachinesTest, DevicesThatVanishAfterTheListingAreOmitted) {
   EXPECT_THAT(before.dump(), HasSubstr("DeviceID=\\\"sda\\\""));
   EXPECT_THAT(after.dump(), Not(HasSubstr("CIM_DiskDrive.CreationClassName=\\\"CIM_DiskDrive\\\",DeviceID=\\\"sda\\\"")));
   EXPECT_THAT(after.dump(), HasSubstr("DeviceID=\\\"nvme0n1\\\""));
+}
+
+// Makes another machine of this process: without sysfs and the records of udev, and with no network and another name.
+bool BecomeAnotherMachine() {
+  if (::unshare(CLONE_NEWNS | CLONE_NEWNET | CLONE_NEWUTS) != 0) return false;
+  if (::mount("none", "/", nullptr, MS_REC | MS_PRIVATE, nullptr) != 0) return false;
+  for (char const* directory : {"/sys", "/run"})
+    if (::mount("none", directory, "tmpfs", 0, nullptr) != 0) return false;
+  return ::sethostname("elsewhere", 9) == 0;
+}
+
+TEST_F(UnusualMachinesTest, NothingOfThisMachineIsInTheDescriptionOfAnother) {
+  if (::geteuid() != 0) GTEST_SKIP() << "only root can make namespaces";
+  auto const here = JsonOf(Report({"--json"}));
+  pid_t const child = ::fork();
+  if (child == 0) ::_exit(BecomeAnotherMachine() ? Report({"--json"}).fStatus : 126);
+  int status = 0;
+  ASSERT_EQ(::waitpid(child, &status, 0), child);
+  ASSERT_EQ(status, 0) << ReadFile(fInstalled.Path("err"));
+  auto const elsewhere = nlohmann::json::parse(ReadFile(fInstalled.Path("out")));
+  EXPECT_GT(here["instances"].size(), 1000u);
+  EXPECT_TRUE(here["instances"] == elsewhere["instances"]) << nlohmann::json::diff(here["instances"], elsewhere["instances"]);
 }
 
 // The machine on which the test runs, whatever it is.

@@ -83,11 +83,21 @@ def memory_array():
 
 
 def memory_module(number):
-    """128 MiB of DDR4 with ECC; each processor has four modules."""
+    """128 MiB of DDR4 with ECC; each processor has four modules. The last one keeps its contents (NVDIMM-N)."""
     structure = Structure(17, 0x1100 + number).number(2, ARRAY, 0xFFFE, 72, 64, 128).number(1, 9, 0)
     structure.text(f"DIMM {number}").text(f"P{number // 4} channel {number % 4}").number(1, 0x1A).number(2, 0x2080, 3200)
     structure.text("Example Memory").text(f"MS{number:06}").text(f"RACK5-M{number}").text("EM4-3200-128").number(1, 2)
-    return structure.number(4, 0).number(2, 2933, 1200, 1200, 1200)
+    structure.number(4, 0).number(2, 2933, 1200, 1200, 1200)
+    keeps, size = number == 7, 128 << 20
+    structure.number(1, 4 if keeps else 3).number(2, 0x18 if keeps else 0x08).text("NV 1.2" if keeps else "")
+    structure.number(2, 0x2C80, 0x4410, 0x2C80 if keeps else 0, 0x0012 if keeps else 0)
+    return structure.number(8, size if keeps else 0, size, 0, size if keeps else 0)
+
+
+def trusted_platform_module():
+    structure = Structure(43, 0x2B00)
+    structure.fields = b"EXM\0"
+    return structure.number(1, 2, 0).number(4, 7 << 16 | 62, 0).text("Example TPM").number(8, 1 << 3).number(4, 0)
 
 
 def onboard_device(number, name, kind, bus, device):
@@ -110,6 +120,7 @@ def structures():
         yield memory_module(number)
     yield onboard_device(0, "Management Graphics", 3, 0, 1)
     yield onboard_device(1, "SATA Controller", 9, 0, 31)
+    yield trusted_platform_module()
 
 
 def main():

@@ -1,5 +1,6 @@
 # SPDX-License-Identifier: Apache-2.0
-"""The facts of smartctl."""
+"""The facts of smartctl and mdadm."""
+import re
 
 # About the run of smartctl itself.
 OF_THE_RUN = ("json_format_version", "smartctl", "local_time", "drive_database_version", "in_smartctl_database", "device")
@@ -24,6 +25,33 @@ def facts_of_smartctl(disk, document):
     for attribute in table:
         for fact, value in leaves(attribute):
             yield [f"ZEP:smart:{disk}:{attribute['id']}"], f"attribute.{fact}", value
+
+
+def facts_of_mdadm(array, text):
+    """Of --detail: lines "Fact : value", then a table of the members."""
+    for line in text.splitlines():
+        if match := re.match(r"\s*([^:]+) : (.*)", line):
+            fact, value = match.groups()
+            if fact.endswith("Size"):
+                value = int(value.split()[0]) * 1024
+            if fact == "Used Dev Size":
+                continue
+            for part in str(value).split(", "):
+                yield [array], fact, part.split("  (")[0]
+        elif match := re.match(r"\s*(?:\d+|-) +\d+ +\d+ +(\d+|-) +(.*?) +/dev/(\w+)$", line):
+            slot, states, member = match.groups()
+            names = [f"ZEP:raid:{array}:{member}"]
+            yield names, "member slot", None if slot == "-" else slot
+            yield names, "member state", {"active sync": "in_sync"}.get(states, states)
+
+
+def facts_of_mdadm_export(array, text):
+    for line in text.splitlines():
+        fact, _, value = line.partition("=")
+        names = [array]
+        if match := re.fullmatch(r"MD_DEVICE_dev_(\w+)_(ROLE|DEV)", fact):
+            names, fact, value = [f"ZEP:raid:{array}:{match[1]}"], match[2], value.removeprefix("/dev/")
+        yield names, fact, value
 
 
 def missing_while_suspended(before, after):

@@ -18,7 +18,9 @@ OBJECTS = {
     17: ["Memory device {n}"],
     32: ["Boot"],
     38: ["IPMI interface {n}"],
+    19: ["Main memory"],
     41: ["Onboard device {n}"],
+    43: ["tpm{n}"],
 }
 
 NO_VALUE = ("Not Specified", "Not Provided", "Unspecified", "Unknown", "None", "Not Settable", "No", "",
@@ -99,6 +101,8 @@ def parts_of(kind, fact, value):
         return value.split(", ")
     if (kind, fact) == (17, "Type Detail"):
         return re.findall(r"\S+(?: \([^)]*\))?", value)
+    if (kind, fact) == (17, "Memory Operating Mode Capability"):
+        return re.findall(r"(?:Volatile|\S+ persistent) memory", value)
     return [value]
 
 
@@ -112,6 +116,8 @@ def facts_of_lshw_firmware(node, dmidecode, system):
             yield names, f"{kind} {fact}", lshw_value(kind, fact, node.get(fact))
         for fact, value in node.get("configuration", {}).items():
             yield names, f"{kind} configuration.{fact}", value
+        for fact in node.get("capabilities", {}):
+            yield names, f"{kind} capabilities.{fact}", fact
     for child in node.get("children", []):
         yield from facts_of_lshw_firmware(child, dmidecode, system)
 
