@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 
 // Compares zep with ipmitool, each run as a program, for reading the identity of a remote server from a simulated
-// controller; a query of a hundred controllers with a query of the slowest one alone; and the checksum of a message with a
-// plain loop. Needs root, to create its own network namespace.
+// controller; the inventory of a controller with 66 sensors with ipmitool's table of sensors, both with cached sensor records; a
+// query of a hundred controllers with a query of the slowest one alone; and the checksum of a message with a plain loop. Needs
+// root, to create its own network namespace.
 
 #include "IIPMILan.h"
 
@@ -20,6 +21,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <filesystem>
 #include <fstream>
 #include <memory>
 #include <stdexcept>
@@ -30,11 +32,38 @@ namespace {
 
 constexpr int kControllers = 4;               // simulators; each has room for 63 sessions
 constexpr char const* kSilent = "192.0.2.2";  // an address that never answers
+constexpr char const* kWithSensors = "127.2.0.99";
 
 std::string AddressOf(int controller) { return "127.2.0." + std::to_string(controller % kControllers + 1); }
 
 void Do(std::string const& command) {
   if (std::system(command.c_str()) != 0) throw std::runtime_error("failed: " + command);
+}
+
+std::string ReplaceAll(std::string text, std::string const& from, std::string const& to) {
+  for (std::size_t at = 0; (at = text.find(from, at)) != std::string::npos; at += to.size()) text.replace(at, from.size(), to);
+  return text;
+}
+
+// The commands for the simulator to have the six sensors of the tests, and the fan among them sixty times more.
+std::string ManySensors() {
+  std::ifstream file(ZEP_SOURCE_DIR "/tests/system/ipmi/sim/sensors.emu");
+  std::string all, fan;
+  for (std::string line; std::getline(file, line); all += line + "\n")
+    if (line.find(" 0x31 ") != std::string::npos) fan += line + "\n";
+  constexpr int first = 0x60, more = 60;
+  for (int number = first; number < first + more; ++number) {
+    char text[8];
+    std::snprintf(text, sizeof text, " 0x%02x ", number);
+    all += ReplaceAll(fan, " 0x31 ", text);
+  }
+  return all;
+}
+
+std::string FileOf(std::string const& name, std::string const& text) {
+  std::string const path = "/tmp/zep-ipmi-bench-" + std::to_string(::getpid()) + name;
+  std::ofstream(path) << text;
+  return path;
 }
 
 // The network in which everything runs: the controllers on loopback, and an interface to an address that never answers.
@@ -46,6 +75,9 @@ public:
        "ip link set silent1 up && ip addr add 192.0.2.1/24 dev silent0");
     ::setenv("ZEP_BMC_PASSWORD", "zeppass1", 1);
     for (int n = 0; n < kControllers; ++n) Start(AddressOf(n));
+    std::string const sensors = FileOf(".emu", ManySensors());
+    Start(kWithSensors, "--more " + sensors);
+    ::unlink(sensors.c_str());
   }
   ~TNetwork() {
     for (pid_t simulator : fSimulators) ::kill(simulator, SIGTERM);
@@ -53,9 +85,9 @@ public:
   }
 
 private:
-  void Start(std::string const& address) {
-    std::FILE* const script =
-        ::popen((ZEP_SOURCE_DIR "/tests/system/ipmi/sim/start.sh --addr " + address + " 623 2>/dev/null").c_str(), "re");
+  void Start(std::string const& address, std::string const& more = "") {
+    std::FILE* const script = ::popen(
+        (ZEP_SOURCE_DIR "/tests/system/ipmi/sim/start.sh --addr " + address + " " + more + " 623 2>/dev/null").c_str(), "re");
     int simulator = 0;
     if (std::fscanf(script, "ready pid %d", &simulator) != 1) throw std::runtime_error("no simulator");
     fScripts.push_back(script);
@@ -67,12 +99,6 @@ private:
 };
 
 void UseNetwork() { static TNetwork const network; }
-
-std::string FileOf(std::string const& name, std::string const& text) {
-  std::string const path = "/tmp/zep-ipmi-bench-" + std::to_string(::getpid()) + name;
-  std::ofstream(path) << text;
-  return path;
-}
 
 // Runs a program and returns its exit status and its output.
 std::pair<int, std::string> OutputOf(std::vector<std::string> const& command) {
@@ -126,6 +152,31 @@ void Identity_ipmitool(benchmark::State& state) {
   ::unlink(reads.c_str());
 }
 BENCHMARK(Identity_ipmitool)->UseRealTime();
+
+// The controller, its accounts, FRU data and event log, too. The first run fills the cache.
+void Inventory_Zep(benchmark::State& state) {
+  UseNetwork();
+  std::string const cache = "/tmp/zep-ipmi-bench-" + std::to_string(::getpid()) + ".cache";
+  ::setenv("XDG_CACHE_HOME", cache.c_str(), 1);
+  RunRepeatedly(state, {ZEP_PROGRAM, "remote", kWithSensors, "--user", "zepadmin", "--inventory"}, "4500 RPM");
+  std::filesystem::remove_all(cache);
+}
+BENCHMARK(Inventory_Zep)->UseRealTime();
+
+void Inventory_ipmitool(benchmark::State& state) {
+  UseNetwork();
+  std::string const cache = FileOf(".sdr", "");
+  std::vector<std::string> const ipmitool = {"ipmitool",   "-I", "lanplus",  "-C", "3",       "-H",
+                                             kWithSensors, "-U", "zepadmin", "-P", "zeppass1"};
+  auto const with = [&](std::vector<std::string> arguments) {
+    arguments.insert(arguments.begin(), ipmitool.begin(), ipmitool.end());
+    return arguments;
+  };
+  OutputOf(with({"sdr", "dump", cache}));
+  RunRepeatedly(state, with({"-S", cache, "sensor"}), "4500.000");
+  ::unlink(cache.c_str());
+}
+BENCHMARK(Inventory_ipmitool)->UseRealTime();
 
 // A hundred controllers at once, ten of which do not answer.
 void Hundred_Zep(benchmark::State& state) {
