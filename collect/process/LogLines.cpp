@@ -45,6 +45,12 @@ std::vector<TLogLine> LogLinesOf(std::string const& text) {
   return lines;
 }
 
+// The middle is removed rarely, because that moves the end.
+void AddToLog(std::string& log, std::string_view text, std::size_t most) {
+  log.append(text);
+  if (log.size() > most + most / 2) log.erase(most / 2, log.size() - most);
+}
+
 std::string LastLogLineOf(std::string const& text) {
   std::vector<TLogLine> const lines = LogLinesOf(text.substr(text.size() - std::min(text.size(), kEnd)));
   if (lines.empty()) return "";

@@ -187,12 +187,8 @@ void TPlugInProcess::ReadWords() {
   ReadFrom(fWordsEnd, [&](std::string_view text) { fWords.Add(text); });
 }
 
-// The middle is removed rarely, because that moves the end.
 void TPlugInProcess::ReadLog() {
-  ReadFrom(fLogEnd, [&](std::string_view text) {
-    fLog.append(text);
-    if (fLog.size() > kMostLog + kMostLog / 2) fLog.erase(kMostLog / 2, fLog.size() - kMostLog);
-  });
+  ReadFrom(fLogEnd, [&](std::string_view text) { AddToLog(fLog, text, kMostLog); });
 }
 
 void TPlugInProcess::ReadVerdict() {

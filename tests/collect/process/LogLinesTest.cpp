@@ -38,5 +38,15 @@ TEST(LogLinesTest, TheLastLineIsCutAndSearchedNearTheEnd) {
   EXPECT_EQ(LastLogLineOf(entry + "no disk\n" + std::string(100'000, '\n')), "");
 }
 
+TEST(LogLinesTest, ALongLogLosesItsMiddle) {
+  std::string log = "first";
+  AddToLog(log, " and last", 40);
+  EXPECT_EQ(log, "first and last");
+  for (int n = 0; n < 100; ++n) AddToLog(log, "0123456789", 40);
+  EXPECT_LE(log.size(), 60u);
+  EXPECT_EQ(log.substr(0, 20), "first and last012345");
+  EXPECT_EQ(log.substr(log.size() - 20), "01234567890123456789");
+}
+
 }  // namespace
 }  // namespace NQRVZEP20
