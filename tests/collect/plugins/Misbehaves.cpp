@@ -69,6 +69,11 @@ void Crash() {
   *static_cast<char volatile*>(page) = 1;
 }
 
+[[noreturn]] void PrintForever(int fd) {
+  std::string const text = "begin" + std::string(64 * 1024, '.');
+  for (;;) [[maybe_unused]] ssize_t const written = ::write(fd, text.data(), text.size());
+}
+
 // A process in a session of its own, which holds every descriptor.
 void StartDaemon(std::string const& name) {
   if (::fork() == 0) {
@@ -348,6 +353,8 @@ std::map<std::string, TMisdeed> const kWhileFilling = {
      [] {
        for (int n = 0; n < 100000; ++n) std::printf("line %d\n", n);
      }},
+    {"PrintsForever", [] { PrintForever(STDOUT_FILENO); }},
+    {"PrintsErrorsForever", [] { PrintForever(STDERR_FILENO); }},
     {"ChangesDirectory", [] { [[maybe_unused]] int const status = ::chdir("/"); }},
     {"Forks", [] { StartDaemon("Forks"); }},
     {"ForksTwice", [] { [[maybe_unused]] pid_t const copy = ::fork(); }},

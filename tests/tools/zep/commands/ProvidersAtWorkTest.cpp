@@ -7,6 +7,7 @@
 #include <gmock/gmock.h>
 #include <pty.h>
 #include <sched.h>
+#include <sys/resource.h>
 #include <sys/wait.h>
 
 #include <algorithm>
@@ -122,6 +123,28 @@ TEST_F(ProvidersAtWorkTest, AnEndlessAnswerIsCutOff) {
   EXPECT_EQ(run.fStatus, 2);
   EXPECT_EQ(FailureIn(JsonOf(run), "AnswersForever")["error"], "its result exceeds 268435456 bytes");
   EXPECT_EQ(FailureIn(JsonOf(run), "AnswersForever")["limit"], "size");
+}
+
+// The address space of zep, and of each plug-in, is limited to far less than what is printed in that time.
+TEST_F(ProvidersAtWorkTest, APlugInThatPrintsForEverIsEndedAndItsWordsAreCut) {
+  fZep.Remove("libHost.nsp.so");
+  Add({"PrintsForever", "PrintsErrorsForever"});
+  rlimit before{};
+  ::getrlimit(RLIMIT_AS, &before);
+  rlimit const most{256 * 1024 * 1024, before.rlim_max};
+  if (!kIsSanitized) ::setrlimit(RLIMIT_AS, &most);  // a sanitizer reserves more
+  TRun const run = Run({"report", "--json", "--plugin-timeout", "6"});
+  ::setrlimit(RLIMIT_AS, &before);
+  EXPECT_EQ(run.fStatus, 1);
+  auto const document = JsonOf(run);
+  for (auto const& plugIn : document["plugIns"]) {
+    std::string const words = plugIn["words"];
+    EXPECT_EQ(plugIn["providers"][0]["error"], "it exceeded the time limit of 6 s");
+    EXPECT_EQ(words.rfind("begin....", 0), 0u);
+    EXPECT_LT(words.size(), 9000u);
+    EXPECT_THAT(words, testing::ContainsRegex("[0-9]{8,} bytes omitted"));
+  }
+  EXPECT_EQ(document["plugIns"].size(), 2u);
 }
 
 // ---- Interrupts and the terminal ----
