@@ -158,6 +158,12 @@ TDeclaredValues DeclaredValuesOf(ICIMClass const& cls) {
 
 }  // namespace
 
+TDeclaration const* FindDeclaration(TClassContent const& cls, std::string const& name) {
+  auto const found = std::find_if(cls.fDeclarations.begin(), cls.fDeclarations.end(),
+                                  [&](TDeclaration const& declaration) { return IsSameName(declaration.fName, name); });
+  return found == cls.fDeclarations.end() ? nullptr : &*found;
+}
+
 TClassContent ContentOf(ICIMClass const& cls) {
   TClassContent content{cls.GetName(kNone), {}, {}, cls.IsAbstract(kNone), DeclaredValuesOf(cls)};
   AddDeclarations(cls, content.fDeclarations);

@@ -37,6 +37,9 @@ struct TClassContent {
   std::vector<TDeclaredValue> fDeclaredValues;  // of the class, its properties, methods and parameters, without superclasses
 };
 
+// The declaration of that name, in any case; null if there is none.
+TDeclaration const* FindDeclaration(TClassContent const& cls, std::string const& name);
+
 struct TPropertyContent {
   std::string fName;
   TCIMValue fValue;

@@ -23,6 +23,7 @@ constexpr TNamedRule kRules[] = {
     {"fill-differs", CheckFillDiffers},
     {"keys", CheckKeys},
     {"text", CheckText},
+    {"types", CheckTypes},
     {"schema", CheckSchema},
     {"time-and-memory", CheckTimeAndMemory},
     {"left-behind", CheckLeftBehind},

@@ -56,9 +56,10 @@ void CheckTimeAndMemory(TObservation const& observation, TRuleResult& result);
 void CheckLeftBehind(TObservation const& observation, TRuleResult& result);
 void CheckOutput(TObservation const& observation, TRuleResult& result);
 
-// Of the namespaces (ContentRules.cpp, DifferenceRule.cpp, SchemaRule.cpp)
+// Of the namespaces (ContentRules.cpp, DifferenceRule.cpp, SchemaRule.cpp, TypeRule.cpp)
 void CheckKeys(TObservation const& observation, TRuleResult& result);
 void CheckText(TObservation const& observation, TRuleResult& result);
+void CheckTypes(TObservation const& observation, TRuleResult& result);
 void CheckFillDiffers(TObservation const& observation, TRuleResult& result);
 void CheckSchema(TObservation const& observation, TRuleResult& result);
 

@@ -14,12 +14,6 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-TDeclaration const* FindDeclaration(TClassContent const& cls, std::string const& name) {
-  auto const found = std::find_if(cls.fDeclarations.begin(), cls.fDeclarations.end(),
-                                  [&](TDeclaration const& declaration) { return IsSameName(declaration.fName, name); });
-  return found == cls.fDeclarations.end() ? nullptr : &*found;
-}
-
 bool Contains(std::vector<std::string> const& names, std::string const& name) {
   return std::any_of(names.begin(), names.end(), [&](std::string const& each) { return IsSameName(each, name); });
 }

@@ -259,7 +259,7 @@ TEST_F(CheckTest, APlugInWithoutFaultsPassesWithItsFigures) {
   EXPECT_EQ(document["plugIn"], "Good");
   EXPECT_EQ(document["schema"], "things.mof");
   for (nlohmann::json const& rule : document["rules"]) EXPECT_EQ(rule["status"], "passed") << rule.dump(2);
-  EXPECT_EQ(document["rules"].size(), 14u);
+  EXPECT_EQ(document["rules"].size(), 15u);
   EXPECT_GT(document["figures"]["peakBytes"], 0);
   nlohmann::json const provider = document["figures"]["providers"][0];
   EXPECT_EQ(provider["name"], "Good");
