@@ -1,0 +1,240 @@
+// SPDX-License-Identifier: Apache-2.0
+
+// Every fault that files of the kernel or answers of programs and controllers can show: planted in a recorded machine, it is
+// found with its rule alone, and it is gone when mended.
+
+#include "tests/Machines.h"
+#include "tests/providers/controller/ControllerBytes.h"
+#include "tests/tools/zep/Zep.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <regex>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+using testing::Each;
+using testing::IsEmpty;
+using testing::Not;
+
+// Returns the content of a file with the fault. A file that does not exist is empty, and is removed when the fault is mended.
+using TFault = std::function<std::string(std::string const& content)>;
+
+TFault Content(std::string const& content) {
+  return [content](std::string const&) { return content; };
+}
+
+TFault Replaced(std::string const& from, std::string const& to) {
+  return [from, to](std::string text) {
+    std::size_t const at = text.rfind(from);
+    EXPECT_NE(at, std::string::npos) << from;
+    return at == std::string::npos ? text : text.replace(at, from.size(), to);
+  };
+}
+
+TFault Patched(std::size_t offset, std::string const& bytes) {
+  return [offset, bytes](std::string content) { return content.replace(offset, bytes.size(), bytes); };
+}
+
+struct TRow {
+  char const* fProblem;  // severity and rule
+  std::vector<std::pair<std::string, TFault>> fChanges;
+};
+
+class RecordedFaultsTest : public testing::Test {
+protected:
+  RecordedFaultsTest() {
+    for (char const* library :
+         {"libDevices.nsp.so", "libNetwork.nsp.so", "libStorage.nsp.so", "libSensors.nsp.so", "libController.nsp.so"})
+      fInstalled.Add(library, std::string(TEST_LIB_DIR "/") + library);
+  }
+
+  // The problems as "severity rule".
+  std::vector<std::string> Problems() const {
+    TCall call{{"report", "--json", "--plugin-timeout", "60"}, {{"ZEP_ROOT", fMachine.Root()}}};
+    call.fOutputFile = fInstalled.Path("document");
+    fInstalled.Run(call);
+    std::vector<std::string> problems;
+    nlohmann::json const document = nlohmann::json::parse(ReadFile(call.fOutputFile));
+    for (nlohmann::json const& problem : document["findings"]["problems"]) {
+      EXPECT_FALSE(problem["remedy"].get<std::string>().empty()) << problem;
+      problems.push_back(problem["severity"].get<std::string>() + " " + problem["rule"].get<std::string>());
+    }
+    return problems;
+  }
+
+  std::string Path(std::string const& path) const { return fMachine.Root() + "/" + path; }
+
+  // Each fault is mended before the next is planted, so that its problem would be found beside that of the next.
+  template <std::size_t N>
+  void ExpectFoundAndGone(TRow const (&rows)[N]) const {
+    for (TRow const& row : rows) ExpectFound(row);
+    EXPECT_THAT(Problems(), IsEmpty()) << "all are mended";
+  }
+
+  void ExpectFound(TRow const& row) const {
+    SCOPED_TRACE(row.fProblem);
+    std::map<std::string, std::string> healthy;
+    std::vector<std::string> added;
+    for (auto const& [path, fault] : row.fChanges) {
+      bool const isThere = fs::exists(Path(path));
+      if (isThere)
+        healthy[path] = ReadFile(Path(path));
+      else
+        added.push_back(path), fs::create_directories(fs::path(Path(path)).parent_path());
+      WriteFile(Path(path), fault(isThere ? healthy[path] : ""));
+    }
+    auto const problems = Problems();
+    EXPECT_THAT(problems, Not(IsEmpty()));
+    EXPECT_THAT(problems, Each(row.fProblem));
+    for (auto const& [path, content] : healthy) WriteFile(Path(path), content);
+    for (std::string const& path : added) fs::remove(Path(path));
+  }
+
+  TInstallation fInstalled;
+  TRecordedMachine fMachine{"server"};
+};
+
+std::string const kPort = "sys/devices/pci0000:00/0000:00:03.0/", kCard = kPort + "0000:01:00.0/";
+std::string const kDisk = kCard + "0000:02:00.0/0000:03:00.0/", kSensor = kDisk + "nvme/nvme0/hwmon0/";
+std::string const kEthernet = kCard + "0000:02:01.0/0000:04:00.0/net/eth1/";
+std::string const kSupply = "sys/class/power_supply/", kModules = "sys/devices/system/edac/mc/mc0/";
+std::string const kAnswers = "zep-answers/", kIpmi = kAnswers + "ipmi/";
+
+TEST_F(RecordedFaultsTest, OfDisksAndFileSystems) {
+  ASSERT_THAT(Problems(), IsEmpty());
+  std::string const spare = R"("available_spare":0,"available_spare_threshold":0)";
+  TFault const reallocated = [](std::string report) {
+    std::string const none = R"("raw":{"value":0,)";
+    return report.replace(report.find(none, report.find("Reallocated_Sector_Ct")), none.size(), R"("raw":{"value":51,)");
+  };
+  TRow const rows[] = {
+      {"critical disk-failing",
+       {{kAnswers + "smartctl/sda", Replaced(R"("smart_status":{"passed":true)", R"("smart_status":{"passed":false)")}}},
+      {"error disk-lost", {{"sys/class/block/sda/device/state", Content("offline\n")}}},
+      {"warning disk-worn", {{kAnswers + "smartctl/nvme0n1", Replaced(R"("percentage_used":0)", R"("percentage_used":95)")}}},
+      {"error disk-worn",
+       {{kAnswers + "smartctl/nvme0n1", Replaced(spare, R"("available_spare":3,"available_spare_threshold":10)")}}},
+      {"warning disk-sectors", {{kAnswers + "smartctl/sda", reallocated}}},
+      {"critical array-degraded",
+       {{"sys/block/md0/md/degraded", Content("1\n")},
+        {"sys/block/md0/md/dev-vda1/state", Content("faulty\n")},
+        {"sys/block/md0/md/dev-vda1/slot", Content("none\n")}}},
+      {"error file-system-full", {{kAnswers + "statvfs/data/values", Content("1024 1024 89361 60 50 25376 25364 255\n")}}},
+      {"error file-system-inodes", {{kAnswers + "statvfs/data/values", Content("1024 1024 89361 68867 61772 25376 0 255\n")}}},
+      {"error file-system-read-only", {{"proc/self/mountinfo", Replaced("ext4 /dev/md0 rw", "ext4 /dev/md0 ro")}}},
+  };
+  ExpectFoundAndGone(rows);
+}
+
+TEST_F(RecordedFaultsTest, OfPortsAndLinks) {
+  constexpr std::size_t speed = 4, duplex = 8;  // in the answer of ethtool
+  std::string const settings = kAnswers + "ethtool/eth1/linksettings";
+  std::string const width8 = "8\n", rate8 = "8.0 GT/s PCIe\n", rate2 = "2.5 GT/s PCIe\n";
+  TRow const rows[] = {
+      {"warning port-slow", {{settings, Patched(speed, Bytes({100, 0, 0, 0}))}}},
+      {"warning port-half-duplex", {{settings, Patched(duplex, Bytes({0}))}}},
+      {"error bond-member", {{kEthernet + "bonding_slave/mii_status", Content("down\n")}}},
+      {"warning pci-link", {{kCard + "max_link_width", Content(width8)}, {kCard + "current_link_width", Content("4\n")}}},
+      {"warning pci-link", {{kCard + "max_link_speed", Content(rate8)}, {kCard + "current_link_speed", Content(rate2)}}},
+      {"error pci-errors", {{kPort + "aer_dev_fatal", Replaced("TOTAL_ERR_FATAL 0", "TOTAL_ERR_FATAL 1")}}},
+      {"warning pci-errors", {{kPort + "aer_dev_correctable", Replaced("TOTAL_ERR_COR 0", "TOTAL_ERR_COR 1001")}}},
+  };
+  ExpectFoundAndGone(rows);
+}
+
+TEST_F(RecordedFaultsTest, OfTheCountersOfPorts) {
+  fs::remove_all(Path(kAnswers + "netlink"));  // then sysfs is read
+  ASSERT_THAT(Problems(), IsEmpty());
+  TRow const rows[] = {
+      {"warning port-errors",
+       {{kEthernet + "statistics/rx_packets", Content("100000\n")}, {kEthernet + "statistics/rx_errors", Content("10\n")}}}};
+  ExpectFoundAndGone(rows);
+}
+
+TEST_F(RecordedFaultsTest, OfSensorsAndMemory) {
+  TRow const rows[] = {
+      {"error sensor-threshold", {{kSensor + "temp1_input", Content("100850\n")}}},
+      {"warning sensor-threshold", {{kSensor + "temp1_input", Content("75850\n")}}},
+      {"error fan-stopped", {{kSensor + "fan1_input", Content("0\n")}, {kSensor + "fan1_min", Content("500\n")}}},
+      {"error power-supply-lost",
+       {{kSupply + "PSU1/type", Content("Mains\n")},
+        {kSupply + "PSU1/online", Content("1\n")},
+        {kSupply + "PSU2/type", Content("Mains\n")},
+        {kSupply + "PSU2/online", Content("0\n")}}},
+      {"critical memory-errors",
+       {{kModules + "dimm0/dimm_label", Content("DIMM_A1\n")},
+        {kModules + "dimm0/dimm_ce_count", Content("0\n")},
+        {kModules + "dimm0/dimm_ue_count", Content("1\n")}}},
+      {"warning memory-errors",
+       {{kModules + "dimm0/dimm_label", Content("DIMM_A1\n")},
+        {kModules + "dimm0/dimm_ce_count", Content("101\n")},
+        {kModules + "dimm0/dimm_ue_count", Content("0\n")}}},
+  };
+  ExpectFoundAndGone(rows);
+}
+
+// The second module, in the channel of the first and smaller. Its strings follow its fields; the length is the second byte.
+std::string WithSmallerModule(std::string table) {
+  constexpr char type = 17;
+  std::size_t const strings = table.find("DIMM 1");
+  std::size_t start = strings - 2;
+  while (table[start] != type || static_cast<std::uint8_t>(table[start + 1]) != strings - start) --start;
+  table[start + 0x0C] = 64;  // MiB
+  return Replaced("P0 channel 1", "P0 channel 0")(table);
+}
+
+TEST_F(RecordedFaultsTest, OfTheSystem) {
+  std::string const unit = R"([{"unit":"backup.service","load":"loaded","active":"failed","sub":"failed","description":"b"}])";
+  TFault const secondProcessor = [](std::string text) {
+    std::size_t const second = text.find("processor\t: 2");  // each has two cores
+    return text.substr(0, second) + std::regex_replace(text.substr(second), std::regex("0x1000065"), "0x1000064");
+  };
+  TRow const rows[] = {
+      {"warning processors-differ", {{"proc/cpuinfo", secondProcessor}}},
+      {"warning memory-differs", {{"sys/firmware/dmi/tables/DMI", WithSmallerModule}}},
+      {"information processor-weakness", {{"sys/devices/system/cpu/vulnerabilities/meltdown", Content("Vulnerable\n")}}},
+      {"warning clock-synchronized", {{"proc/uptime", Content("7200.00 1.00\n")}}},
+      {"error kernel-taint", {{"proc/sys/kernel/tainted", Content("128\n")}}},
+      {"warning failed-units", {{kAnswers + "systemctl/failed", Content(unit)}}},
+      {"warning out-of-memory",
+       {{"dev/kmsg", Content("3,1,1000000,-;Memory cgroup out of memory: Killed process 158 (tail) total-vm:7048kB\n")}}},
+      {"error hardware-errors", {{"dev/kmsg", Content("2,1,1000000,-;{1}[Hardware Error]: event severity: fatal\n")}}},
+      {"error disk-errors", {{"dev/kmsg", Content("3,1,1000000,-;I/O error, dev sda, sector 8 op 0x1:(WRITE)\n")}}},
+  };
+  ExpectFoundAndGone(rows);
+}
+
+// With the answers of a controller, recorded through /dev/ipmi0: a temperature (1), a fan (2) and a power supply (3). The
+// readings and the empty event log are those of a healthy one.
+TEST_F(RecordedFaultsTest, OfTheManagementController) {
+  fs::copy(TestDataPath("controller/zep-answers/ipmi"), Path(kIpmi));
+  std::string const info = ReadFile(Path(kIpmi + "0a40-"));
+  WriteFile(Path(kIpmi + "0a40-"), Patched(2, Bytes({0, 0}))(info));
+  WriteFile(Path(kIpmi + "042d-01"), Bytes({0, 70, 0xC0, 0}));
+  WriteFile(Path(kIpmi + "042d-02"), Bytes({0, 45, 0xC0, 0}));
+  WriteFile(Path(kIpmi + "042d-03"), Bytes({0, 0, 0xC0, 1, 0}));
+  WriteFile(Path(kIpmi + "0642-01"), Bytes({0, 1, 4, 1, 0, 0, 0, 0, 0, 0}));  // a LAN channel
+  WriteFile(Path(kIpmi + "0644-0101"), Bytes({0, 2, 0x82, 0, 0x0F}));         // of two accounts, the first is disabled
+  WriteFile(Path(kIpmi + "0644-0102"), Bytes({0, 2, 0x42, 0, 0x14}));
+  WriteFile(Path(kIpmi + "0646-01"), Bytes({0}) + std::string(16, '\0'));
+  WriteFile(Path(kIpmi + "0646-02"), Bytes({0}) + "support" + std::string(9, '\0'));
+  ASSERT_THAT(Problems(), IsEmpty());
+  TRow const rows[] = {
+      {"error sensor-threshold", {{kIpmi + "042d-01", Content(Bytes({0, 91, 0xC0, 0x18}))}}},
+      {"error fan-stopped", {{kIpmi + "042d-02", Content(Bytes({0, 0, 0xC0, 0x07}))}}},
+      {"error controller-part-failed", {{kIpmi + "042d-03", Content(Bytes({0, 0, 0xC0, 3, 0}))}}},
+      {"error event-log-critical", {{kIpmi + "0a40-", Content(info)}}},
+      {"warning event-log-full", {{kIpmi + "0a40-", Patched(4, Bytes({0, 0}))}}},
+      {"warning controller-clock", {{kIpmi + "0a48-", Content(Bytes({0, 9, 0, 0, 0}))}}},
+      {"information controller-account", {{kIpmi + "0646-02", Content(Bytes({0}) + "ADMIN" + std::string(11, '\0'))}}},
+      {"warning controller-account", {{kIpmi + "0644-0101", Content(Bytes({0, 2, 0x42, 0, 0x14}))}}},
+  };
+  ExpectFoundAndGone(rows);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep
