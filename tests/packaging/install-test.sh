@@ -22,7 +22,7 @@ status=0
 [[ $status == 0 || $status == 2 ]] || { echo "the installed zep ended with $status" >&2; exit 1; }
 grep -q SAMPLE "$work/report"
 
-diff -r "$here/../../docs/schema" "$work/prefix/share/zepcore/schema"
+diff -r "$here/../../docs/schema" "$work/prefix/share/zepcore/json-schema"
 
 expected=$(printf '%s\nQRVSG_ComputerSystem\nkZEPStatusFail\nkZEPStatusNotFound: Failed to find nsp named Nothing' "$private")
 check() {  # check NAME PROGRAM
