@@ -176,9 +176,21 @@ TReportAnswer Processors(TNamespaceView const& view) {
   return TReportAnswer::Known(sorted, source);
 }
 
+// The memory that the kernel uses, for a machine whose firmware describes no modules.
+TReportAnswer MemoryOfKernel(TNamespaceView const& view) {
+  for (auto const& memory : view.InstancesOf("CIM_Memory")) {
+    TValueAnswer const id = view.Answer(*memory, "DeviceID");
+    if (!id.IsKnown() || id.fValue->ToString() != "Main memory") continue;
+    TValueAnswer const number = view.Answer(*memory, "NumberOfBlocks");
+    auto const blocks = NumberIn(number), block = NumberIn(view.Answer(*memory, "BlockSize"));
+    if (blocks && block) return TReportAnswer::Known(TMemorySize{*blocks * *block, 0, 0}, number.fSource);
+  }
+  return StillUnknown(view.AnswerWithoutInstance("CIM_PhysicalMemory", "Capacity"));
+}
+
 TReportAnswer Memory(TNamespaceView const& view) {
   auto const modules = view.InstancesOf("CIM_PhysicalMemory");
-  if (modules.empty()) return StillUnknown(view.AnswerWithoutInstance("CIM_PhysicalMemory", "Capacity"));
+  if (modules.empty()) return MemoryOfKernel(view);
   TMemorySize size{0, modules.size(), 0};
   TValueAnswer capacity;
   for (auto const& module : modules) {

@@ -28,8 +28,8 @@ struct TProcessorKind {
 };
 
 struct TMemorySize {
-  std::uint64_t fBytes;         // the sum of the modules of known size
-  std::size_t fModules;         // the number of all modules
+  std::uint64_t fBytes;         // the sum of the modules of known size; without modules, the memory that the kernel uses
+  std::size_t fModules;         // the number of all modules; 0 if the firmware describes none
   std::size_t fUnknownModules;  // the number of modules of unknown size; less than fModules
 };
 

@@ -9,6 +9,7 @@
 #include "MissingValueClass.h"
 #include "TCIMSchemaHelper.h"
 #include "collect/FailureOf.h"
+#include "collect/SectionSubjects.h"
 #include "collect/TValueWords.h"
 #include "collect/UnitText.h"
 
@@ -26,110 +27,7 @@ using TCell = TReportSection::TCell;
 using TInstancePtr = boost::shared_ptr<ICIMInstance>;
 
 constexpr char const* kOther = "other";
-constexpr char const* kIdentifiers = "OtherIdentifyingInfo";
 constexpr char const* kIdentifierKinds = "IdentifyingDescriptions";
-
-enum class ECell {
-  kProperty,
-  kIdentifier,  // the element of the array that has the description fOther
-  kProduct,     // a size in bytes: the property times the property fOther
-  kEither,      // the property fOther where the first has no value
-  kDescribed    // the property fOther where the value of the first is named "Other"
-};
-
-struct TColumn {
-  char const* fTitle;
-  char const* fProperty;
-  ECell fCell = ECell::kProperty;
-  char const* fOther = nullptr;
-};
-
-// A section for the instances of a class and its subclasses.
-struct TSubject {
-  char const* fKey;
-  char const* fTitle;
-  char const* fClass;
-  std::vector<TColumn> fColumns;
-};
-
-std::vector<TSubject> const& Subjects() {
-  static std::vector<TSubject> const subjects = {
-      {"processors",
-       "Processors",
-       "CIM_Processor",
-       {{"Processor", "DeviceID"},
-        {"Name", "ElementName"},
-        {"Cores", "NumberOfEnabledCores"},
-        {"Speed", "MaxClockSpeed"},
-        {"Status", "CPUStatus"}}},
-      {"memory",
-       "Memory modules",
-       "CIM_PhysicalMemory",
-       {{"Slot", "ElementName"},
-        {"Size", "Capacity"},
-        {"Type", "MemoryType", ECell::kDescribed, "Description"},
-        {"Speed", "ConfiguredMemoryClockSpeed"},
-        {"Maker", "Manufacturer"},
-        {"Part number", "PartNumber"},
-        {"Serial number", "SerialNumber"}}},
-      {"disks",
-       "Disks",
-       "CIM_MediaAccessDevice",
-       {{"Disk", "DeviceID"},
-        {"Model", "ElementName"},
-        {"Serial number", kIdentifiers, ECell::kIdentifier, "Serial number"},
-        {"Size", "MaxMediaSize"},
-        {"Status", "StatusDescriptions"}}},
-      {"volumes",
-       "Volumes",
-       "CIM_StorageVolume",
-       {{"Volume", "DeviceID"},
-        {"Name", "ElementName"},
-        {"Size", "NumberOfBlocks", ECell::kProduct, "BlockSize"},
-        {"Status", "StatusDescriptions"}}},
-      {"file-systems",
-       "File systems",
-       "CIM_LocalFileSystem",
-       {{"File system", "Name"},
-        {"Type", "FileSystemType"},
-        {"Size", "FileSystemSize"},
-        {"Free", "AvailableSpace"},
-        {"Read-only", "ReadOnly"}}},
-      {"ports",
-       "Network ports",
-       "CIM_NetworkPort",
-       {{"Port", "DeviceID"},
-        {"Address", "PermanentAddress"},
-        {"Speed", "Speed"},
-        {"Full duplex", "FullDuplex"},
-        {"Status", "StatusDescriptions"}}},
-      {"addresses",
-       "IP addresses",
-       "CIM_IPProtocolEndpoint",
-       {{"Address", "ElementName"}, {"Interface", "InterfaceName"}, {"Origin", "AddressOrigin"}, {"Scope", "Scope"}}},
-      {"routes",
-       "Routes",
-       "CIM_NextHopIPRoute",
-       {{"Destination", "DestinationAddress"},
-        {"Mask or prefix", "DestinationMask", ECell::kEither, "PrefixLength"},
-        {"Gateway", "Gateway"},
-        {"Interface", "InterfaceName"},
-        {"Metric", "Metric"},
-        {"Set by", "Protocol"}}},
-      {"pci",
-       "PCI devices",
-       "CIM_PCIDevice",
-       {{"Address", "DeviceID"},
-        {"Device", "Name"},
-        {"Class", "Caption"},
-        {"Driver", kIdentifiers, ECell::kIdentifier, "Driver"}}},
-      {"usb",
-       "USB devices",
-       "CIM_USBDevice",
-       {{"Device", "DeviceID"}, {"Maker", "Manufacturer"}, {"Product", "Product"}, {"Serial number", "SerialNumber"}}},
-  };
-  return subjects;
-}
 
 // ---- Cells ----
 
@@ -142,13 +40,13 @@ std::string UnitOf(ICIMPropertyDecl const& property) {
 bool IsArray(TCIMValue const& value) { return (value.GetType() & TCIMValue::TCIMType::kCIMTypeArrayFlag) != 0; }
 
 // The name of an enumerated value alone, because a table has little room; otherwise the value with its unit. The elements of an
-// array are separated by commas.
+// array are separated by commas; without any, it is "none".
 std::string TextOf(TCIMValue const& value, TValueWords const& words, std::string const& unit) {
   if (IsArray(value)) {
     std::string text;
     for (TCIMValue const& element : static_cast<std::vector<TCIMValue>&>(value))
       text += (text.empty() ? "" : ", ") + TextOf(element, words, unit);
-    return text;
+    return text.empty() ? "none" : text;
   }
   std::string const word = words.WordFor(value);
   return word.empty() ? TextWithUnit(value, unit) : word;
@@ -203,8 +101,49 @@ TCell DescribedCell(TNamespaceView const& view, ICIMInstance const& instance, st
   return description.IsKnown() ? description : cell;
 }
 
+// "525400112201" as "52:54:00:11:22:01".
+std::string InPairs(std::string const& address) {
+  std::string digits = address;
+  for (std::size_t at = 2; at < digits.size(); at += 3) digits.insert(at, ":");
+  return digits;
+}
+
+// "tmpfs on /run" as "tmpfs".
+std::string WithoutPlace(std::string const& name) { return name.substr(0, name.find(" on /")); }
+
+// "93784 s" as "1 d 2 h 3 min".
+std::string InDays(std::string const& seconds) {
+  constexpr unsigned long long minute = 60, hour = 60 * minute, day = 24 * hour;
+  unsigned long long number = 0;
+  if (std::from_chars(seconds.data(), seconds.data() + seconds.size(), number).ec != std::errc()) return seconds;
+  std::string text = number < day ? "" : std::to_string(number / day) + " d ";
+  if (number >= hour) text += std::to_string(number % day / hour) + " h ";
+  return text + std::to_string(number % hour / minute) + " min";
+}
+
+// The text of the property, changed.
+TCell ChangedCell(TNamespaceView const& view, ICIMInstance const& instance, TColumn const& column,
+                  std::string (*change)(std::string const&)) {
+  TCell cell = PropertyCell(view, instance, column.fProperty);
+  if (cell.IsKnown()) cell.fValue = change(*cell.fValue);
+  return cell;
+}
+
+TCell NumberCell(TNamespaceView const& view, ICIMInstance const& instance, std::string const& name) {
+  TAnswer<TCIMValue> const answer = view.Answer(instance, name);
+  return answer.IsKnown() ? TCell::Known(answer.fValue->ToString(), answer.fSource) : Unknown(answer);
+}
+
 TCell CellOf(TNamespaceView const& view, ICIMInstance const& instance, TColumn const& column) {
   switch (column.fCell) {
+    case ECell::kNumber:
+      return NumberCell(view, instance, column.fProperty);
+    case ECell::kDuration:
+      return ChangedCell(view, instance, column, InDays);
+    case ECell::kSource:
+      return ChangedCell(view, instance, column, WithoutPlace);
+    case ECell::kMacAddress:
+      return ChangedCell(view, instance, column, InPairs);
     case ECell::kIdentifier:
       return IdentifierCell(view, instance, column.fOther);
     case ECell::kProduct:
@@ -233,23 +172,49 @@ std::vector<TCell> RowOf(TNamespaceView const& view, ICIMInstance const& instanc
   return row;
 }
 
+void SortByName(std::vector<std::vector<TCell>>& rows) {
+  auto const nameOf = [](std::vector<TCell> const& row) { return row.front().fValue.value_or(""); };
+  std::stable_sort(rows.begin(), rows.end(), [&](auto const& a, auto const& b) { return nameOf(a) < nameOf(b); });
+}
+
+// The reason for the class or, if only those below have one, for the first of them that does; empty if the namespace has none.
+std::string RecordedReason(TNamespaceView const& view, ICIMClass const& cls) {
+  TMissing const why = view.WhyNoInstance(cls.GetName(TCIMContext()));
+  if (why.fCode != kMissingNotDescribed) return why.fReason;
+  std::string reason;
+  cls.EnumerateSubClasses(
+      [&](boost::shared_ptr<ICIMClass> const& below) {
+        reason = RecordedReason(view, *below);
+        return reason.empty();
+      },
+      TCIMContext());
+  return reason;
+}
+
+// Why the section has no row of this provider; empty if nothing says so.
+std::string WhyNoRow(TNamespaceView const& view, ICIMClass const& cls, std::string const& className) {
+  bool const isOfSample = !view.GetSampleLabel().empty() && !view.InstancesOf(className).empty();
+  return isOfSample ? "the sample does not describe them" : RecordedReason(view, cls);
+}
+
 TReportSection SectionOf(TSubject const& subject, std::vector<TNamespaceView> const& views) {
   TReportSection section{subject.fKey, subject.fTitle, {}, {}, ""};
   for (TColumn const& column : subject.fColumns) section.fColumns.emplace_back(column.fTitle);
-  std::string whyEmpty = "no provider describes them";
+  std::string whyEmpty;  // the reason of the first provider that has one
   for (TNamespaceView const& view : views) {
     std::string const failure = FailureOf([&] {
-      if (!view.FindClass(subject.fClass)) return;
+      auto const cls = view.FindClass(subject.fClass);
+      if (!cls) return;
       for (TInstancePtr const& instance : view.InstancesOf(subject.fClass)) {
         auto const row = RowOf(view, *instance, subject);
         if (!IsEmptyRow(row) && view.IsOfReport(*instance)) section.fRows.push_back(row);
       }
-      bool const isOfSample = view.GetSampleLabel().empty() || view.InstancesOf(subject.fClass).empty();
-      whyEmpty = isOfSample ? view.WhyNoInstance(subject.fClass).fReason : "the sample does not describe them";
+      if (whyEmpty.empty()) whyEmpty = WhyNoRow(view, *cls, subject.fClass);
     });
     if (!failure.empty()) whyEmpty = "provider " + view.GetProviderName() + " failed: " + failure;
   }
-  if (section.fRows.empty()) section.fWhyEmpty = whyEmpty;
+  if (subject.fIsSorted) SortByName(section.fRows);
+  if (section.fRows.empty()) section.fWhyEmpty = whyEmpty.empty() ? "no provider describes them" : whyEmpty;
   return section;
 }
 
@@ -267,7 +232,7 @@ bool IsShownElsewhere(boost::shared_ptr<ICIMClass const> const& cls) {
                                        TCIMSchemaHelper::kOperatingSystemCreationClassName, "QRVSG_ZEPProduct",
                                        kMissingValueClass, "CIM_ComputerSystem"};
   if (shown.count(cls->GetName(TCIMContext())) > 0 || cls->GetClassFlag(TCIMContext())) return true;
-  auto const& subjects = Subjects();
+  auto const& subjects = SectionSubjects();
   return std::any_of(subjects.begin(), subjects.end(), [&](TSubject const& subject) { return IsBelow(cls, subject.fClass); });
 }
 
@@ -297,7 +262,7 @@ TReportSection OtherClasses(std::vector<TNamespaceView> const& views) {
 
 std::vector<std::string> SectionKeys() {
   std::vector<std::string> keys;
-  for (TSubject const& subject : Subjects()) keys.emplace_back(subject.fKey);
+  for (TSubject const& subject : SectionSubjects()) keys.emplace_back(subject.fKey);
   keys.emplace_back(kOther);
   return keys;
 }
@@ -306,7 +271,7 @@ std::vector<TReportSection> MakeSections(std::vector<TPlugIn> const& plugIns, st
   auto const views = ViewsOf(plugIns);
   auto const isWanted = [&](std::string const& key) { return std::find(keys.begin(), keys.end(), key) != keys.end(); };
   std::vector<TReportSection> sections;
-  for (TSubject const& subject : Subjects())
+  for (TSubject const& subject : SectionSubjects())
     if (isWanted(subject.fKey)) sections.push_back(SectionOf(subject, views));
   if (isWanted(kOther)) sections.push_back(OtherClasses(views));
   return sections;

@@ -72,7 +72,9 @@ private:
     std::vector<TPort> const ports = PortsOf(fFiles, fLinks);
     std::vector<TPort> ethernet, other;
     for (TPort const& port : ports) (port.IsEthernet() ? ethernet : other).push_back(port);
-    WritePortClass(other, EmptyPort(false), "no port other than of Ethernet is a device of this machine");
+    WritePortClass(other, EmptyPort(false),
+                   ports.empty() ? "no network interface is a device of this machine"
+                                 : "no port other than of Ethernet is a device of this machine");
     WritePortClass(ethernet, EmptyPort(true), "no Ethernet port is a device of this machine");
     for (TPort const& port : ports)
       fWriter.Associate(kSapOfDevice, fPorts.at(port.fLink.fName), InterfaceNamed(port.fLink.fName));

@@ -68,7 +68,10 @@ void WriteFirmware(TStorage& storage) {
 }  // namespace
 
 void WriteDrives(TStorage& storage) {
-  WriteDrivesOf(storage, TBlockDevice::kDisk, "the kernel lists no disk drives: no device in /sys/class/block is a disk");
+  WriteDrivesOf(storage, TBlockDevice::kDisk,
+                storage.fFiles.Exists("/sys/class/block")
+                    ? "the kernel lists no disk drives: no device in /sys/class/block is a disk"
+                    : "the kernel lists no disk drives: /sys/class/block does not exist");
   WriteDrivesOf(storage, TBlockDevice::kOptical, "the kernel lists no optical drives: no device in /sys/class/block is one");
   WriteDrivesOf(storage, TBlockDevice::kDiskette, "the kernel lists no floppy drives: no device in /sys/class/block is one");
   WriteDrivesOf(storage, TBlockDevice::kTape, "the kernel lists no tape drives: /sys/class/scsi_tape has none");

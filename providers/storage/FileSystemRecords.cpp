@@ -17,7 +17,7 @@ using TNumber = TFinding<unsigned long>;
 // Values of the schema (ValueNames.h).
 constexpr unsigned short kPersistent = 2, kTemporary = 3, kExternal = 4;
 
-TMissing NotMounted() { return {kMissingNotGiven, "the file system is not mounted"}; }
+TMissing NotMounted() { return {kMissingNotApplicable, "the file system is not mounted"}; }
 
 TUse UseOf(TMachineFiles const& files, TFileSystem const& fileSystem) {
   if (fileSystem.fMounts.empty()) return NotMounted();

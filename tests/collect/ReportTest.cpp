@@ -111,6 +111,18 @@ TEST_F(HardwareTest, MemoryIsInBytesAndModules) {
   EXPECT_EQ(size.fUnknownModules, 1u);
 }
 
+TEST_F(HardwareTest, WithoutModulesTheMemoryIsThatOfTheKernel) {
+  fNamespace->DefineClass("CIM_Memory")
+      .Key("DeviceID", "string")
+      .Property("BlockSize", "uint64")
+      .Property("NumberOfBlocks", "uint64");
+  fNamespace->AddInstance("CIM_Memory", {{"DeviceID", "L1d 0 cache"}, {"BlockSize", 1ul}, {"NumberOfBlocks", 32768ul}});
+  fNamespace->AddInstance("CIM_Memory", {{"DeviceID", "Main memory"}, {"BlockSize", 1024ul}, {"NumberOfBlocks", 4096ul}});
+  auto const size = ValueOf<TMemorySize>(Report(), "memory");
+  EXPECT_EQ(size.fBytes, 4194304u);
+  EXPECT_EQ(size.fModules, 0u);
+}
+
 TEST_F(HardwareTest, MemoryOfUnknownSizeIsMissing) {
   fNamespace->AddInstance("CIM_PhysicalMemory", {{"Tag", "0"}});
   EXPECT_EQ(AnswerOf(Report(), "memory").fMissing.fReason, "the provider gives no value");

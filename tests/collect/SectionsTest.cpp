@@ -14,8 +14,10 @@ namespace NQRVZEP20 {
 namespace {
 
 using testing::ElementsAre;
+using testing::EndsWith;
 using testing::HasSubstr;
 using testing::IsEmpty;
+using testing::StartsWith;
 
 class SectionsTest : public testing::Test {
 protected:
@@ -66,6 +68,73 @@ TEST_F(SectionsTest, EachInstanceIsARowWithUnitsNamesAndReasons) {
   fWriter.WriteMissing();
   EXPECT_THAT(Rows("memory"), ElementsAre("DIMM 1|16 GiB|DDR4|2.933 GHz|Example Works|EX-16|<placeholder text \"0\">",
                                           "DIMM 2|<unknown size>|DDR4|2.933 GHz|Example Works|EX-16|<placeholder text \"0\">"));
+}
+
+TEST_F(SectionsTest, TheRunningSystemHasItsUptimeInDays) {
+  auto const state = [](unsigned long seconds, std::vector<std::string> const& units) {
+    TRecord record("ZEP_RunningState", "/proc/uptime", "CIM_StatisticalData");
+    record.AddKey("InstanceID", std::to_string(seconds));
+    record.Add("Uptime", TFinding<unsigned long>(seconds)).Unit("second");
+    record.Add("FailedUnits", TFinding<std::vector<std::string>>(units));
+    return record;
+  };
+  fWriter.Write(state(0, {}), {state(59, {}), state(7384, {"a.service", "b.service"}), state(93784, {})}, {});
+  fWriter.WriteMissing();
+  EXPECT_THAT(Rows("running"), ElementsAre(StartsWith("0 min|"), StartsWith("2 h 3 min|"), StartsWith("1 d 2 h 3 min|")));
+  EXPECT_THAT(Rows("running"), ElementsAre(EndsWith("|none"), EndsWith("|a.service, b.service"), EndsWith("|none")));
+}
+
+TEST_F(SectionsTest, AnInterfaceHasItsAddressInPairsAndItsMTUAsANumber) {
+  TRecord record("ZEP_NetworkInterface", "rtnetlink", "CIM_LANEndpoint");
+  record.AddKey("Name", "bond0.10");
+  record.Add("Kind", TFinding<std::string>("vlan"));
+  record.Add("MACAddress", TFinding<std::string>("525400112201"));
+  record.Add("MTU", TFinding<unsigned>(1500)).Unit("byte");
+  record.Add("MasterInterface", TFinding<std::string>("br0"));
+  record.Add("OperationalState", TFinding<std::string>("up"));
+  fWriter.Write(record);
+  fWriter.WriteMissing();
+  EXPECT_THAT(Rows("interfaces"), ElementsAre("bond0.10|vlan|52:54:00:11:22:01|1500|br0|up"));
+}
+
+TEST_F(SectionsTest, AFileSystemHasItsSourceAndItsPlace) {
+  auto const fileSystem = [](char const* name, char const* root) {
+    TRecord record("CIM_UnixLocalFileSystem", "statvfs");
+    record.AddKey("Name", name);
+    record.Add("Root", TFinding<std::string>(root));
+    record.Add("FileSystemType", TFinding<std::string>("tmpfs"));
+    record.Add("FileSystemSize", TFinding<unsigned long>(4096)).Unit("byte");
+    record.Add("AvailableSpace", TFinding<unsigned long>(1024)).Unit("byte");
+    record.Add("ReadOnly", TFinding<bool>(false));
+    return record;
+  };
+  fWriter.Write(fileSystem("", ""), {fileSystem("tmpfs on /run (2)", "/run"), fileSystem("/dev/sda on 1", "/")}, {});
+  fWriter.WriteMissing();
+  EXPECT_THAT(Rows("file-systems"), ElementsAre("tmpfs|/run|tmpfs|4 KiB|1 KiB|false", "/dev/sda on 1|/|tmpfs|4 KiB|1 KiB|false"));
+}
+
+TEST_F(SectionsTest, PCIDevicesAreSortedByTheirAddresses) {
+  auto const function = [](char const* className, char const* address) {
+    TRecord record(className, "sysfs");
+    record.AddKey("DeviceID", address);
+    record.Add("Name", TFinding<std::string>(className));
+    return record;
+  };
+  fWriter.Write(function("CIM_PCIDevice", "0000:00:02.0"));
+  fWriter.Write(function("CIM_PCIBridge", "0000:00:01.0"));
+  fWriter.WriteMissing();
+  EXPECT_THAT(Rows("pci"), ElementsAre(StartsWith("0000:00:01.0|CIM_PCIBridge|"), StartsWith("0000:00:02.0|")));
+}
+
+TEST_F(SectionsTest, TheReasonForNoRowMayBeThatOfAClassBelow) {
+  TRecord disk("CIM_DiskDrive", "sysfs");
+  disk.AddKey("DeviceID", "");
+  fWriter.Write(disk, {}, {kMissingNotGiven, "no disk is there"});
+  fWriter.WriteMissing();
+  EXPECT_THAT(Rows("disks"), IsEmpty());
+  EXPECT_EQ(fWhyEmpty, "no disk is there");
+  EXPECT_THAT(Rows("usb"), IsEmpty());
+  EXPECT_EQ(fWhyEmpty, "no provider describes them");
 }
 
 TEST_F(SectionsTest, TheDescriptionNamesAnotherMemoryType) {

@@ -40,6 +40,7 @@ std::string InWords(std::vector<TProcessorKind> kinds) {
 }
 
 std::string InWords(TMemorySize const& size) {
+  if (size.fModules == 0) return SizeText(size.fBytes) + ", as the kernel uses it";
   std::string const text = ExactSizeText(size.fBytes) + " in " + Counted(size.fModules, "module");
   return size.fUnknownModules == 0 ? text : text + ", " + std::to_string(size.fUnknownModules) + " of them of unknown size";
 }

@@ -25,6 +25,7 @@ TEST(ReportPhrasesTest, ValuesArePutIntoWords) {
       {TProcessors{{"Kind A", 2, 20}, {"Kind B", 1, std::nullopt}}, "2 x Kind A, 1 x Kind B"},
       {TMemorySize{std::uint64_t{128} << 30, 8, 0}, "128 GiB in 8 modules"},
       {TMemorySize{512 << 20, 1, 0}, "512 MiB in 1 module"},
+      {TMemorySize{512 << 20, 0, 0}, "512 MiB, as the kernel uses it"},
       {TMemorySize{512 << 20, 2, 1}, "512 MiB in 2 modules, 1 of them of unknown size"},
   };
   for (TRow const& row : rows) EXPECT_EQ(ValueText(row.fValue), row.fText);
