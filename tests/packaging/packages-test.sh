@@ -1,8 +1,9 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
 #
-# Makes the Debian packages of the build tree given, unpacks libzepcore-dev with all packages of ours that it depends on, and
-# makes a plug-in with nothing else: new, build, and its class in the report.
+# Makes the Debian packages of the build tree given. lintian must report nothing about them, and manual pages must be the help
+# texts. Then it unpacks libzepcore-dev with all packages of ours that it depends on, and makes a plug-in with nothing else: new,
+# build, and its class in the report.
 #
 #   packages-test.sh BUILD_DIR CXX
 set -euo pipefail
@@ -20,6 +21,16 @@ fail() {  # fail REASON [FILE]
 
 cpack --config "$build/CPackConfig.cmake" -B "$work/packages" >"$work/log" 2>&1 || fail "the packages are not made:" "$work/log"
 
+# The maintainer's address is that of whoever makes the packages (ZEP_PACKAGE_CONTACT).
+if command -v lintian >/dev/null; then
+  lintian --allow-root --suppress-tags bogus-mail-host,bogus-mail-host-in-debian-changelog "$work"/packages/*.deb >"$work/log" 2>&1 ||
+    fail "lintian fails:" "$work/log"
+  [[ ! -s $work/log ]] || fail "lintian reports:" "$work/log"
+else
+  [[ ${CI:-} != true ]] || fail "lintian is not installed"
+  echo "lintian is not installed: the packages are not checked"
+fi
+
 # Unpacks the package and those of ours that it depends on.
 unpack() {  # unpack NAME
   local file depends
@@ -34,6 +45,14 @@ unpack libzepcore-dev
 zep=$work/root/usr/bin/zep
 [[ -x $zep ]] || fail "libzepcore-dev does not bring zep"
 
+# The text of a manual page, below its heading, is that of the help.
+help_of_page() { gzip -dc "$work/root/usr/share/man/man1/$1.1.gz" | sed -n '/^\.nf$/,/^\.fi$/p' | sed '1d;$d; s/^\\&//; s/\\-/-/g; s/\\e/\\/g'; }
+for command in "" report "plugin new"; do
+  read -ra words <<<"$command"
+  diff <("$zep" help "${words[@]}" | tail -n +2) <(help_of_page "zep${command:+-${command// /-}}") >"$work/log" ||
+    fail "the manual page of zep $command differs from its help:" "$work/log"
+done
+
 cd "$work"
 "$zep" plugin new Everything --class X_Everything --mof "$here/everything.mof" >"$work/log" || fail "zep plugin new failed"
 cmake -G Ninja -S Everything -B project -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/root/usr" >"$work/log" ||
@@ -42,4 +61,4 @@ cmake --build project >"$work/log" || fail "it is not built:" "$work/log"
 export ZEP_SMBIOS_TABLE=$work/root/usr/share/zepcore/sample/smbios.bin
 "$zep" report --section other --plugin project/libEverything.nsp.so >"$work/log" || true  # an incomplete report is not a failure here
 grep -q 'X_Everything .*root/everything' "$work/log" || fail "the class is not in the report:" "$work/log"
-echo "a plug-in needs libzepcore-dev alone"
+echo "the packages work, and a plug-in needs libzepcore-dev alone"

@@ -1,0 +1,64 @@
+# SPDX-License-Identifier: Apache-2.0
+
+# The Debian packages. Each has a changelog and its licence; lintian reports nothing about them (tests/packaging).
+
+set(ZEP_PACKAGE_CONTACT "the zepcore developers <maintainers@localhost>" CACHE STRING "The maintainer that the packages name")
+
+set(CPACK_GENERATOR DEB)
+set(CPACK_DEB_COMPONENT_INSTALL ON)
+set(CPACK_STRIP_FILES ON)
+set(CPACK_PACKAGE_CONTACT ${ZEP_PACKAGE_CONTACT})
+set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
+set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
+set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS_PRIVATE_DIRS ${ZEP_LIB_DIR})
+set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
+set(CPACK_COMPONENTS_ALL)
+
+find_program(ZEP_GZIP gzip REQUIRED)
+configure_file(changelog.in ${CMAKE_CURRENT_BINARY_DIR}/changelog @ONLY)
+execute_process(COMMAND ${ZEP_GZIP} -9 -n -c ${CMAKE_CURRENT_BINARY_DIR}/changelog
+  OUTPUT_FILE ${CMAKE_CURRENT_BINARY_DIR}/changelog.gz COMMAND_ERROR_IS_FATAL ANY)
+
+# A package with the files of one component of the installation:
+#
+#   zep_package(COMPONENT NAME SYNOPSIS TEXT SECTION COPYRIGHT [DEPENDS package,...] [RECOMMENDS ...] [SUGGESTS ...])
+#
+# A line of TEXT has at most 79 characters.
+macro(zep_package component name synopsis text section copyright)
+  cmake_parse_arguments(ARG "" "DEPENDS;RECOMMENDS;SUGGESTS" "" ${ARGN})
+  string(TOUPPER ${component} upper)
+  list(APPEND CPACK_COMPONENTS_ALL ${component})
+  set(CPACK_DEBIAN_${upper}_PACKAGE_NAME ${name})
+  set(CPACK_DEBIAN_${upper}_PACKAGE_SECTION ${section})
+  set(CPACK_COMPONENT_${upper}_DESCRIPTION "${synopsis}\n${text}")
+  foreach(relation DEPENDS RECOMMENDS SUGGESTS)
+    set(CPACK_DEBIAN_${upper}_PACKAGE_${relation} ${ARG_${relation}})
+  endforeach()
+  install(FILES ${CMAKE_CURRENT_BINARY_DIR}/changelog.gz DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/${name} COMPONENT ${component})
+  install(FILES ${copyright} DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/${name} RENAME copyright COMPONENT ${component})
+endmacro()
+
+set(core "libzepcore (= ${PROJECT_VERSION})")
+
+# libcurl4 is loaded at run time, for transfers only; pci.ids has the names of PCI devices; smartctl reads the health of disks.
+zep_package(library libzepcore "core library of a server diagnostic data collector"
+"Identity, hardware and health of a server as CIM objects: the library, its
+providers for the host, storage, network, devices and sensors, and its
+library for SMBIOS tables."
+  libs copyright RECOMMENDS "libcurl4, pci.ids" SUGGESTS smartmontools)
+zep_package(ipmi libzepcore-ipmi "management controllers for zepcore, with libfreeipmi"
+"The IPMI client library of zepcore, and its provider of management
+controllers: sensors, event log, FRU data, accounts and LAN addresses."
+  libs copyright-ipmi DEPENDS ${core})
+zep_package(zep zep "server diagnostic data collector: reports on this machine"
+"The reference front end of zepcore: reports the identity, the hardware and
+the problems of this machine, queries management controllers, sends reports,
+and makes and checks plug-ins."
+  admin copyright DEPENDS ${core})
+# zep writes new plug-ins, checks them and loads them.
+zep_package(development libzepcore-dev "kit for plug-ins and front ends of zepcore"
+"Headers, static libraries, files for CMake and pkg-config, and the reduced CIM
+schema of the DMTF, if it was built with it."
+  libdevel copyright-dev DEPENDS "${core}, zep (= ${PROJECT_VERSION}), libboost-dev, libboost-thread-dev"
+  RECOMMENDS "cmake, g++, make, pkg-config")
+include(CPack)
