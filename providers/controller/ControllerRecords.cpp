@@ -28,14 +28,26 @@ TFinding<std::string> MakerOf(TDeviceId const& id) {
   return name;
 }
 
+bool IsUnanswered(TMissing const& why) { return why.fCode == kMissingNoAnswer || why.fCode == kMissingTimeIsUp; }
+
+// Whether every element was answered, also by a refusal; otherwise why not.
+template <class TElement, class T>
+TFinding<bool> AreAnswered(std::vector<TElement> const& elements, TFinding<T> TElement::*answer) {
+  for (TElement const& element : elements)
+    if (!(element.*answer) && IsUnanswered((element.*answer).Why())) return (element.*answer).Why();
+  return true;
+}
+
 // The lists that were not read to their ends, and why.
 std::vector<std::string> UnreadPartsOf(TController const& controller) {
   std::vector<std::string> parts;
   auto const note = [&](char const* list, TFinding<bool> const& isComplete) {
     if (!isComplete) parts.push_back(std::string(list) + ": " + isComplete.Why().fReason);
   };
-  note("sensors", controller.fHasAllRecords);
+  auto const& sensors = controller.fSensors;
+  note("sensors", controller.fHasAllRecords.Then([&](bool) { return AreAnswered(sensors, &TSensorState::fStates); }));
   note("event log", controller.fLog.Then([](TEventLog const& log) { return log.fIsComplete; }));
+  note("FRU data", AreAnswered(controller.fFrus, &TFruDevice::fAreas));
   return parts;
 }
 

@@ -140,6 +140,24 @@ TEST_F(ControllerNamespaceTest, AControllerThatFallsSilentLeavesReasons) {
   EXPECT_EQ(TReasonReader(*fNs).WhyNoInstance("ZEP_EventLog")->fReason, "the controller does not answer");
 }
 
+TEST_F(ControllerNamespaceTest, EveryListThatWasNotReadToItsEndIsNamed) {
+  Fill();
+  std::size_t const all = fController.fRequests;
+  auto const unreadAfter = [&](std::size_t requests) {
+    fController.fMostRequests = requests;
+    fController.fRequests = 0;
+    fNs = NewNamespace();
+    std::string const text = Fill();
+    std::size_t const begin = text.find("UnreadParts: ");
+    return text.substr(begin, text.find('\n', begin) - begin);
+  };
+  EXPECT_THAT(unreadAfter(all), Not(HasSubstr("the controller does not answer")));
+  EXPECT_THAT(unreadAfter(all - 1), HasSubstr("FRU data: the controller does not answer"));
+  EXPECT_THAT(unreadAfter(all - 1), Not(HasSubstr("event log")));
+  EXPECT_THAT(unreadAfter(all - 10), HasSubstr("event log: the controller does not answer"));
+  EXPECT_THAT(unreadAfter(30), HasSubstr("sensors: the controller does not answer"));
+}
+
 TEST_F(ControllerNamespaceTest, NoControllerLeavesTheReasonInEachClass) {
   fController.fMostRequests = 0;
   Fill();

@@ -246,6 +246,16 @@ TEST_F(InventoryTest, TheSensorRecordsAreReadFromTheCacheTheSecondTime) {
   EXPECT_EQ(Instance(again, "CIM_NumericSensor", "ElementName", "CPU Temp")["CurrentReading"]["value"], 91);
 }
 
+TEST_F(InventoryTest, ProgressIsShownOnATerminal) {
+  std::string const zep = fZep.Path("bin/zep") + " remote 127.0.0.1 --user zepadmin --inventory";
+  std::string const command = "TERM=xterm ZEP_BMC_PASSWORD=zeppass1 XDG_CACHE_HOME=" + fDir.Path("cache") + " script -qec '" +
+                              zep + "' " + fDir.Path("screen") + " </dev/null >/dev/null";
+  ASSERT_EQ(std::system(command.c_str()), 0);
+  std::string const screen = ReadFile(fDir.Path("screen"));
+  for (char const* step : {"sensor data records: 1 of 6", "sensors: 6 of 6", "event log entries: 5 of 5"})
+    EXPECT_THAT(screen, HasSubstr(std::string("\r\x1b[Kzep: ") + step));
+}
+
 TEST_F(InventoryTest, AListOfHostsHasOneDocumentEach) {
   TSimulator::TSettings settings;
   settings.fAddress = "127.0.0.2";
@@ -280,8 +290,8 @@ TEST_F(InventoryTest, AControllerThatFallsSilentLeavesWhatWasReadInTime) {
   EXPECT_EQ(run.fStatus, 2);
   json const document = json::parse(run.fOutput);
   EXPECT_THAT(std::string(document["reason"]), HasSubstr("inventory: not read to the end: "));
-  EXPECT_EQ(Instance(document, "ZEP_ManagementController", "FirmwareVersion", "1.10")["UnreadParts"]["value"].size(), 2U)
-      << "the records of the sensors, and the event log";
+  EXPECT_EQ(Instance(document, "ZEP_ManagementController", "FirmwareVersion", "1.10")["UnreadParts"]["value"].size(), 3U)
+      << "the records of the sensors, the event log, and the FRU data";
 }
 
 TEST_F(InventoryTest, WithoutThePlugInTheReasonIsGiven) {
