@@ -191,10 +191,9 @@ std::string RecordedReason(TNamespaceView const& view, ICIMClass const& cls) {
   return reason;
 }
 
-// Why the section has no row of this provider; empty if nothing says so.
-std::string WhyNoRow(TNamespaceView const& view, ICIMClass const& cls, std::string const& className) {
-  bool const isOfSample = !view.GetSampleLabel().empty() && !view.InstancesOf(className).empty();
-  return isOfSample ? "the sample does not describe them" : RecordedReason(view, cls);
+// Why the section has no row of this provider; empty if nothing says so. The reasons of a namespace are about this machine.
+std::string WhyNoRow(TNamespaceView const& view, ICIMClass const& cls) {
+  return view.GetSampleLabel().empty() ? RecordedReason(view, cls) : "the sample does not describe them";
 }
 
 TReportSection SectionOf(TSubject const& subject, std::vector<TNamespaceView> const& views) {
@@ -209,7 +208,7 @@ TReportSection SectionOf(TSubject const& subject, std::vector<TNamespaceView> co
         auto const row = RowOf(view, *instance, subject);
         if (!IsEmptyRow(row) && view.IsOfReport(*instance)) section.fRows.push_back(row);
       }
-      if (whyEmpty.empty()) whyEmpty = WhyNoRow(view, *cls, subject.fClass);
+      if (whyEmpty.empty()) whyEmpty = WhyNoRow(view, *cls);
     });
     if (!failure.empty()) whyEmpty = "provider " + view.GetProviderName() + " failed: " + failure;
   }

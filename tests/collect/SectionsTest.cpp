@@ -217,6 +217,12 @@ TEST_F(SectionsTest, WithASampleTheRowsOfThisMachineAreNotShown) {
   fWriter.Write(Module("DIMM 1", 1ul));
   EXPECT_THAT(Rows("memory", "SAMPLE"), IsEmpty());
   EXPECT_EQ(fWhyEmpty, "the sample does not describe them");
+  TRecord disk("CIM_DiskDrive", "sysfs");
+  disk.AddKey("DeviceID", "");
+  fWriter.Write(disk, {}, {kMissingNotGiven, "this machine has no disk"});
+  fWriter.WriteMissing();
+  EXPECT_THAT(Rows("disks", "SAMPLE"), IsEmpty());
+  EXPECT_EQ(fWhyEmpty, "the sample does not describe them") << "the reason is not about the sample";
   auto const sections = MakeSections(SamplePlugIns(), {"memory"});
   EXPECT_EQ(sections.at(0).fRows.size(), 8u);
 }
