@@ -38,14 +38,29 @@ macro(zep_package component name synopsis text section copyright)
   install(FILES ${copyright} DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/${name} RENAME copyright COMPONENT ${component})
 endmacro()
 
-set(core "libzepcore (= ${PROJECT_VERSION})")
+set(same_version "(= ${PROJECT_VERSION})")
+set(core "libzepcore1 ${same_version}")
 
-# libcurl4 is loaded at run time, for transfers only; pci.ids has the names of PCI devices; smartctl reads the health of disks.
-zep_package(library libzepcore "core library of a server diagnostic data collector"
-"Identity, hardware and health of a server as CIM objects: the library, its
-providers for the host, storage, network, devices and sensors, and its
-library for SMBIOS tables."
-  libs copyright RECOMMENDS "libcurl4, pci.ids" SUGGESTS smartmontools)
+zep_package(library libzepcore1 "core library of a server diagnostic data collector"
+"Identity, hardware and health of a server as CIM objects, which provider
+plug-ins collect. This package has the library, which plug-ins and front ends
+link, and its library for SMBIOS tables."
+  libs copyright RECOMMENDS libcurl4)  # loaded at run time, for transfers only
+
+# A provider: zep_provider_package(NAME TITLE WHAT [SUGGESTS ...] [RECOMMENDS ...])
+macro(zep_provider_package name title what)
+  zep_package(provider_${name} zep-provider-${name} "${title} for the collector zep"
+"A provider plug-in of zepcore, which front ends such as zep load:
+${what}"
+    admin copyright DEPENDS ${core} ${ARGN})
+endmacro()
+zep_provider_package(host "identity and components of the host" "machine, firmware, boards, processors, memory and operating system.")
+zep_provider_package(storage "drives and file systems" "drives, partitions, RAID arrays, volumes and file systems, with their health."
+  SUGGESTS smartmontools)  # smartctl reads the health
+zep_provider_package(network "network ports and addresses" "ports, interfaces, addresses, routes and resolvers.")
+zep_provider_package(devices "PCI and USB devices" "PCI and USB devices, with their drivers and links." RECOMMENDS pci.ids)
+zep_provider_package(sensors "sensors and logged errors" "temperatures, fans, voltages, power, and errors that the kernel counts.")
+
 zep_package(ipmi libzepcore-ipmi "management controllers for zepcore, with libfreeipmi"
 "The IPMI client library of zepcore, and its provider of management
 controllers: sensors, event log, FRU data, accounts and LAN addresses."
@@ -54,11 +69,22 @@ zep_package(zep zep "server diagnostic data collector: reports on this machine"
 "The reference front end of zepcore: reports the identity, the hardware and
 the problems of this machine, queries management controllers, sends reports,
 and makes and checks plug-ins."
-  admin copyright DEPENDS ${core})
+  admin copyright DEPENDS "${core}, zep-provider-host ${same_version}"
+  RECOMMENDS "zep-provider-storage, zep-provider-network, zep-provider-devices, zep-provider-sensors" SUGGESTS libzepcore-ipmi)
 # zep writes new plug-ins, checks them and loads them.
 zep_package(development libzepcore-dev "kit for plug-ins and front ends of zepcore"
 "Headers, static libraries, files for CMake and pkg-config, and the reduced CIM
 schema of the DMTF, if it was built with it."
-  libdevel copyright-dev DEPENDS "${core}, zep (= ${PROJECT_VERSION}), libboost-dev, libboost-thread-dev"
-  RECOMMENDS "cmake, g++, make, pkg-config")
+  libdevel copyright-dev DEPENDS "${core}, zep ${same_version}, libboost-dev, libboost-thread-dev"
+  RECOMMENDS "cmake, g++, make, pkg-config" SUGGESTS libzepcore-doc)
+
+install(DIRECTORY ${PROJECT_SOURCE_DIR}/docs/ DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/libzepcore-doc/docs COMPONENT documentation
+  FILES_MATCHING PATTERN "*.md" PATTERN "schema" EXCLUDE)
+install(FILES ${PROJECT_SOURCE_DIR}/README.md DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/libzepcore-doc COMPONENT documentation)
+install(DIRECTORY ${PROJECT_SOURCE_DIR}/examples DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/libzepcore-doc COMPONENT documentation)
+set(CPACK_DEBIAN_DOCUMENTATION_PACKAGE_ARCHITECTURE all)
+zep_package(documentation libzepcore-doc "documents and examples of zepcore"
+"Tour, architecture, formats and guides for authors of plug-ins and front ends,
+and the sources of their examples."
+  doc copyright)
 include(CPack)

@@ -21,6 +21,14 @@ fail() {  # fail REASON [FILE]
 
 cpack --config "$build/CPackConfig.cmake" -B "$work/packages" >"$work/log" 2>&1 || fail "the packages are not made:" "$work/log"
 
+# Each provider is in its own package; the one that links code under the GPL is in libzepcore-ipmi, which states that.
+holds() { dpkg-deb --contents "$work/packages/$1"_*.deb | grep "/zepcore/$2\$" >/dev/null || fail "$2 is not in $1"; }
+for name in Host Storage Network Devices Sensors; do holds "zep-provider-${name,,}" "lib$name.nsp.so"; done
+holds libzepcore1 libzepcore.so
+holds libzepcore-ipmi libController.nsp.so
+dpkg-deb --fsys-tarfile "$work"/packages/libzepcore-ipmi_*.deb | tar -xO ./usr/share/doc/libzepcore-ipmi/copyright >"$work/log"
+grep -q '^License: GPL-3.0-or-later$' "$work/log" || fail "libzepcore-ipmi does not state its licence:" "$work/log"
+
 # The maintainer's address is that of whoever makes the packages (ZEP_PACKAGE_CONTACT).
 if command -v lintian >/dev/null; then
   lintian --allow-root --suppress-tags bogus-mail-host,bogus-mail-host-in-debian-changelog "$work"/packages/*.deb >"$work/log" 2>&1 ||

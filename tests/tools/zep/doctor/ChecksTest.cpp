@@ -43,7 +43,7 @@ TEST(ChecksTest, EachStateOfTheSmbiosTablesHasACauseAndARemedy) {
        "the kernel's tables cannot be read: Input/output error -> name a dump of the tables in ZEP_SMBIOS_TABLE"},
       {{kLoaded, kSmbiosFail, 0, "/t"}, "there is no SMBIOS table in /t -> name another file in ZEP_SMBIOS_TABLE"},
       {{kNotLoaded, 0, 0, ""},
-       "libsmbios.so cannot be loaded: cannot open shared object file -> install the package libzepcore anew"},
+       "libsmbios.so cannot be loaded: cannot open shared object file -> install the package libzepcore1 anew"},
   };
   for (auto const& row : rows) EXPECT_EQ(TextOf(CheckSmbios(row.fOutcome)), row.fText);
 }
@@ -127,7 +127,7 @@ TEST(ChecksTest, EachPlugInHasACheck) {
 
   std::vector<TCheck> const none = CheckPlugIns({}, "/p");
   ASSERT_EQ(none.size(), 1u);
-  EXPECT_EQ(TextOf(none[0]), "there is no plug-in in /p -> install the package libzepcore, or copy plug-ins there");
+  EXPECT_EQ(TextOf(none[0]), "there is no plug-in in /p -> install the package zep-provider-host, or copy plug-ins there");
 }
 
 TEST(ChecksTest, TheRemedyForAFileThatIsPassedOverIsThatOfTheRule) {
