@@ -44,6 +44,16 @@ read -ra flags <<<"$(pkg-config --cflags --libs zepcore)"
 "$cxx" -std=c++17 "$here/consumer/main.cpp" -o "$work/consumer" "${flags[@]}"
 check "the consumer built with pkg-config" "$work/consumer"
 
+# A provider plug-in without CMake, by each compiler.
+for compiler in "$cxx" clang++; do
+  command -v "$compiler" >/dev/null || { echo "$compiler is not installed: it builds no plug-in"; continue; }
+  read -ra flags <<<"$(pkg-config --cflags --libs zepcore-memory)"
+  "$compiler" -std=c++17 -fPIC -shared -fvisibility=hidden "$here/../../examples/Clock/Clock.cpp" -o "$work/libPlain.nsp.so" "${flags[@]}"
+  "$work/prefix/bin/zep" classes --plugin "$work/libPlain.nsp.so" >"$work/report" 2>&1 || true  # other plug-ins may fail
+  grep -q '^X_Clock ' "$work/report" || { echo "the plug-in built with $compiler and pkg-config is not loaded:" >&2; cat "$work/report" >&2; exit 1; }
+done
+[[ $(realpath "$(pkg-config --variable=plugindir zepcore)") == "$private" ]] || { echo "plugindir is wrong" >&2; exit 1; }
+
 # A provider plug-in of somebody else's, as docs/writing-a-provider.md builds it, and one that states reasons.
 cmake -G Ninja -S "$here/../../examples/Clock" -B "$work/clock" -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/prefix" >"$work/clock.log"
 cmake --build "$work/clock" >>"$work/clock.log" || { cat "$work/clock.log" >&2; exit 1; }
