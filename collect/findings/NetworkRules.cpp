@@ -20,9 +20,10 @@ bool IsUp(TElement const& port) {
   return status.IsKnown() && Has(*status.fValue, "2");
 }
 
-bool IsEnabled(TElement const& port) {
+bool IsSwitchedOn(TElement const& port) {
+  constexpr char const *enabled = "2", *enabledButOffline = "6";
   auto const state = port.Text("EnabledState");
-  return state.IsKnown() && *state.fValue == "2";
+  return state.IsKnown() && (*state.fValue == enabled || *state.fValue == enabledButOffline);
 }
 
 std::uint64_t SumOf(TElement const& statistics, std::initializer_list<char const*> properties) {
@@ -91,7 +92,7 @@ void AskUnpluggedPort(TRuleRun& run) {
   auto const inUse = InterfacesInUse(run);
   for (TElement const& port : run.Elements("CIM_EthernetPort")) {
     auto const status = port.Texts("OperationalStatus");
-    if (!run.Know(port, status) || !IsEnabled(port) || IsUp(port) || inUse.count(port.Label()) == 0) continue;
+    if (!run.Know(port, status) || !IsSwitchedOn(port) || IsUp(port) || inUse.count(port.Label()) == 0) continue;
     run.Add(port, status.fSource, ESeverity::kError, "the network port " + port.Label() + " is in use, but has no link",
             kCheckCable);
   }

@@ -149,7 +149,7 @@ TEST(RulesTest, APortWithHalfDuplexOrFarBelowItsSpeedIsNamed) {
 }
 
 TEST(RulesTest, AnUnpluggedPortIsNamedOnlyIfItIsInUse) {
-  std::string const unplugged = Port("EnabledState = 2; OperationalStatus = {12};");
+  std::string const unplugged = Port("EnabledState = 6; OperationalStatus = {12};");
   auto const address = [](int origin) {
     return "instance of CIM_IPProtocolEndpoint { Name = \"1\"; InterfaceName = \"eth0\"; AddressOrigin = " +
            std::to_string(origin) + "; };";

@@ -146,12 +146,20 @@ TEST_F(RecordedFaultsTest, OfPortsAndLinks) {
   ExpectFoundAndGone(rows);
 }
 
-TEST_F(RecordedFaultsTest, OfTheCountersOfPorts) {
-  fs::remove_all(Path(kAnswers + "netlink"));  // then sysfs is read
+// Without the answers of the kernel's netlink, sysfs is read. The ports of the bond become ports of a bridge.
+TEST_F(RecordedFaultsTest, OfPortsOfABridge) {
+  fs::remove_all(Path(kAnswers + "netlink"));
+  for (char const* bond : {"bond0", "bond0.10"}) fs::remove(Path("sys/class/net/" + std::string(bond)));
+  for (char const* port : {"eth0", "eth1"}) {
+    std::string const master = Path("sys/class/net/" + std::string(port) + "/master");
+    fs::remove(master);
+    fs::create_symlink("/sys/devices/virtual/net/br0", master);
+  }
   ASSERT_THAT(Problems(), IsEmpty());
   TRow const rows[] = {
       {"warning port-errors",
-       {{kEthernet + "statistics/rx_packets", Content("100000\n")}, {kEthernet + "statistics/rx_errors", Content("10\n")}}}};
+       {{kEthernet + "statistics/rx_packets", Content("100000\n")}, {kEthernet + "statistics/rx_errors", Content("10\n")}}},
+      {"error port-unplugged", {{kEthernet + "operstate", Content("down\n")}, {kEthernet + "carrier", Content("0\n")}}}};
   ExpectFoundAndGone(rows);
 }
 
