@@ -5,7 +5,6 @@
 #include "ICIMInstance.h"
 #include "ICIMProperty.h"
 #include "ICIMPropertyDecl.h"
-#include "ICIMQualifier.h"
 #include "MissingValueClass.h"
 #include "TCIMSchemaHelper.h"
 #include "collect/FailureOf.h"
@@ -30,12 +29,6 @@ constexpr char const* kOther = "other";
 constexpr char const* kIdentifierKinds = "IdentifyingDescriptions";
 
 // ---- Cells ----
-
-std::string UnitOf(ICIMPropertyDecl const& property) {
-  auto const qualifier = property.GetQualifier("PUnit", TCIMContext());
-  TCIMValue const unit = qualifier ? qualifier->GetValue(TCIMContext()) : TCIMValue();
-  return unit.IsNull() ? "" : unit.ToString();
-}
 
 bool IsArray(TCIMValue const& value) { return (value.GetType() & TCIMValue::TCIMType::kCIMTypeArrayFlag) != 0; }
 

@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/UnitText.h"
 
+#include "ICIMPropertyDecl.h"
+#include "ICIMQualifier.h"
+
 #include <charconv>
 #include <cmath>
 #include <cstddef>
@@ -73,6 +76,12 @@ std::string Shortened(double number, TUnit const& unit) {
 }
 
 }  // namespace
+
+std::string UnitOf(ICIMPropertyDecl const& property) {
+  auto const qualifier = property.GetQualifier("PUnit", TCIMContext());
+  TCIMValue const unit = qualifier ? qualifier->GetValue(TCIMContext()) : TCIMValue();
+  return unit.IsNull() ? "" : unit.ToString();
+}
 
 std::string TextWithUnit(TCIMValue const& value, std::string const& unit) {
   std::string const text = value.ToString();

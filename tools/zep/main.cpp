@@ -201,8 +201,12 @@ void KeepSecrets(std::vector<std::string> const& words) {
 
 // Reads the words, because CLI11 may have stopped before the option.
 bool IsJsonWanted(std::vector<std::string> const& words) {
-  auto const end = words.begin() + static_cast<std::ptrdiff_t>(WordsOfZep(words));
-  return std::any_of(words.begin(), end, [](std::string const& word) { return word == "--json"; });
+  for (std::size_t at = 0; at < WordsOfZep(words); ++at) {
+    std::string const& word = words[at];
+    bool const isFormat = at > 0 && words[at - 1] == "--format" && word.rfind("json", 0) == 0;
+    if (word == "--json" || isFormat || word.rfind("--format=json", 0) == 0) return true;
+  }
+  return false;
 }
 
 // "zep media mount"; "zep" when the first word is not a command. Also from the words.

@@ -28,10 +28,12 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
+constexpr char const* kJsonLines = "jsonl";
 constexpr char const* kToMedia = "zep report --to-media";
 
 struct TArguments {
   bool fAsJson = false;
+  std::string fFormat;  // "text", "json" or "jsonl"; empty: as fAsJson says
   bool fSample = false;
   bool fBySftp = false;
   std::string fTarget;  // empty: nowhere
@@ -127,7 +129,10 @@ int Deliver(TReport const& report, TTarget const& target, TArguments const& argu
     document.Members()["exitStatus"] = static_cast<int>(status);
     document.Members()["reason"] = CountsOf(report.fFindings);
   }
-  if (arguments.fAsJson) document.Write(WriteOutput);
+  if (arguments.fFormat == kJsonLines)
+    document.WriteLines(WriteOutput);
+  else if (arguments.fAsJson)
+    document.Write(WriteOutput);
   return status;
 }
 
@@ -136,6 +141,8 @@ int Report(TArguments const& arguments) {
   std::optional<TSample> sample;
   std::optional<TInterruptGuard> guard;
   try {
+    if (arguments.fFormat == kJsonLines && !arguments.fMedium.empty())
+      throw TWrongUsage("--format jsonl and --to-media exclude each other");
     TTarget const target = arguments.fTarget.empty() ? TTarget{} : TargetOf(arguments.fTarget, arguments.fBySftp);
     if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
     sample = SampleIf(arguments.fSample);
@@ -155,12 +162,27 @@ int Report(TArguments const& arguments) {
 TRun AddReportArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   auto* const json = command.add_flag("--json", arguments->fAsJson, "Print one JSON document, with every instance");
+  auto* const format =
+      command
+          .add_option_function<std::string>(
+              "--format",
+              [arguments](std::string const& name) {
+                arguments->fFormat = name;
+                arguments->fAsJson = name != "text";
+              },
+              "text, json (the same as --json), or jsonl: the document without instances on one line, then a line for each\n"
+              "instance, and a line with their number")
+          ->check(CLI::IsMember({"text", "json", kJsonLines}).description("text, json or jsonl"))
+          ->type_name("NAME")
+          ->excludes(json);
   command.add_option("--section", arguments->fParts.fSections, "Print only this section (repeatable)")
       ->check(CLI::IsMember(SectionNames()).description(Joined(SectionNames(), ", ")))
       ->type_name("NAME")
-      ->excludes(json);
+      ->excludes(json)
+      ->excludes(format);
   command.add_flag("--full", arguments->fParts.fAllInstances, "Also print every instance with all its properties")
-      ->excludes(json);
+      ->excludes(json)
+      ->excludes(format);
   command.add_flag("--sample", arguments->fSample, "Report on the bundled sample, an invented server, labelled SAMPLE");
   command.add_option(
       "--to-media", arguments->fMedium,

@@ -2,6 +2,7 @@
 #include "tools/zep/output/Json.h"
 
 #include "ICIMClass.h"
+#include "collect/UnitText.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/secrets/Secrets.h"
 
@@ -76,6 +77,10 @@ std::string AsVerbatimText(TJson const& document) { return document.dump(2, ' ',
 
 std::string AsLine(TJson document) {
   HideSecretsIn(document);
+  return AsVerbatimLine(document);
+}
+
+std::string AsVerbatimLine(TJson const& document) {
   return document.dump(-1, ' ', false, TJson::error_handler_t::replace) + "\n";
 }
 
@@ -137,11 +142,12 @@ TJson TInstanceJson::Of(ICIMInstance const& instance) {
 TJson TInstanceJson::PropertyAsJson(ICIMInstance const& instance, ICIMProperty const& property) {
   TCIMValue const value = property.GetValue(TCIMContext());
   TDeclared const& declared = DeclaredBy(property.GetDeclaration(TCIMContext()));
-  TJson json = ObjectFor(6);
+  TJson json = ObjectFor(7);
   json["type"] = NameOf(value.GetType());
   json["value"] = ValueAsJson(value);
   TJson words = WordsAsJson(declared.fWords, value);
   if (!words.is_null()) json["words"] = std::move(words);
+  if (!declared.fUnit.empty()) json["unit"] = declared.fUnit;
   if (declared.fIsKey) json["key"] = true;
   json["source"] = declared.fSource;
   if (value.IsNull()) {
@@ -155,7 +161,8 @@ TJson TInstanceJson::PropertyAsJson(ICIMInstance const& instance, ICIMProperty c
 TInstanceJson::TDeclared const& TInstanceJson::DeclaredBy(TDeclaration const& declaration) {
   auto const found = fDeclared.find(declaration);
   if (found != fDeclared.end()) return found->second;
-  TDeclared declared{TValueWords(*declaration), declaration->IsKey(TCIMContext()), fView.SourceOf(*declaration)};
+  TDeclared declared{TValueWords(*declaration), UnitOf(*declaration), declaration->IsKey(TCIMContext()),
+                     fView.SourceOf(*declaration)};
   return fDeclared.emplace(declaration, std::move(declared)).first->second;
 }
 

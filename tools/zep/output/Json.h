@@ -35,8 +35,9 @@ TJson DocumentHead(std::string const& what, EExitStatus status, std::string cons
 std::string AsText(TJson document);
 std::string AsLine(TJson document);
 
-// Like AsText, but with the messages verbatim, too, for a document that is sent or stored.
+// The same with the messages verbatim, too, for a document that is sent or stored.
 std::string AsVerbatimText(TJson const& document);
+std::string AsVerbatimLine(TJson const& document);
 
 // The text, or null if it is empty.
 TJson OrNull(std::string const& text);
@@ -60,13 +61,14 @@ class TInstanceJson {
 public:
   explicit TInstanceJson(TNamespaceView const& view);
 
-  // The instance with its path and all properties, each with type, value, source, and for a missing value the reason.
+  // The instance with its path and all properties, each with type, value, unit, source, and for a missing value the reason.
   TJson Of(ICIMInstance const& instance);
 
 private:
   using TDeclaration = boost::shared_ptr<ICIMPropertyDecl const>;
   struct TDeclared {
     TValueWords fWords;
+    std::string fUnit;  // empty without one
     bool fIsKey;
     std::string fSource;
   };

@@ -3,11 +3,13 @@
 
 #include "ICIMInstance.h"
 #include "collect/FailureOf.h"
+#include "collect/Sections.h"
 #include "tools/zep/output/FindingsJson.h"
 #include "tools/zep/output/PlugInRows.h"
 #include "tools/zep/output/ReportPhrases.h"
 
 #include <cstring>
+#include <ctime>
 #include <string_view>
 
 namespace NQRVZEP20::zep {
@@ -33,6 +35,38 @@ TJson PlugInsAsJson(std::vector<TPlugIn> const& plugIns) {
   return json;
 }
 
+TJson CellAsJson(TReportSection::TCell const& cell) {
+  if (cell.IsKnown()) return *cell.fValue;
+  return {{"code", cell.fMissing.fCode}, {"reason", cell.fMissing.fReason}};
+}
+
+TJson SectionsAsJson(std::vector<TReportSection> const& sections) {
+  TJson json = TJson::array();
+  for (TReportSection const& section : sections) {
+    TJson rows = TJson::array();
+    for (auto const& row : section.fRows) {
+      rows.push_back(TJson::array());
+      for (auto const& cell : row) rows.back().push_back(CellAsJson(cell));
+    }
+    json.push_back({{"key", section.fKey},
+                    {"title", section.fTitle},
+                    {"columns", section.fColumns},
+                    {"rows", rows},
+                    {"whyEmpty", OrNull(section.fWhyEmpty)}});
+  }
+  return json;
+}
+
+// "2026-11-23T04:05:06Z"
+std::string Now() {
+  std::time_t const now = std::time(nullptr);
+  std::tm utc{};
+  ::gmtime_r(&now, &utc);
+  char text[sizeof "2026-11-23T04:05:06Z"];
+  std::strftime(text, sizeof text, "%Y-%m-%dT%H:%M:%SZ", &utc);
+  return text;
+}
+
 constexpr char const* kLineOfInstances = "\n  \"instances\": ";  // in no text of the document, which has no line ends
 
 // Appends the lines of a document, indented as an element of an array in a member of the outermost object.
@@ -51,11 +85,13 @@ TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fM
   EExitStatus const status = ExitStatusOf(report.fCompleteness);
   fMembers = DocumentHead("zep report", status, WhyNotComplete(report), SampleLabelOf(report));
   fMembers["status"] = NameOf(status);
+  fMembers["time"] = Now();
   fMembers["head"] = HeadLines(report);
   fMembers["smbiosTableFile"] = OrNull(report.fTableFile);
   fMembers["findings"] = FindingsAsJson(report.fFindings);
   fMembers["identity"] = RowsAsJson(report.fIdentity);
   fMembers["details"] = RowsAsJson(report.fDetails);
+  fMembers["sections"] = SectionsAsJson(MakeSections(report.fPlugIns, SectionKeys()));
   fMembers["plugInDirectory"] = PlugInDirectory();
   fMembers["plugIns"] = PlugInsAsJson(report.fPlugIns);
   fMembers["instances"] = nullptr;
@@ -83,27 +119,52 @@ std::string TReportDocument::TextOf(TJson json) const {
   return fMessages == EMessages::kVerbatim ? AsVerbatimText(json) : AsText(std::move(json));
 }
 
+std::string TReportDocument::LineOf(TJson json) const {
+  return fMessages == EMessages::kVerbatim ? AsVerbatimLine(json) : AsLine(std::move(json));
+}
+
+void TReportDocument::WriteLines(TWriter const& write) const {
+  TJson members = fMembers;
+  members.erase("instances");
+  write(LineOf(std::move(members)));
+  std::size_t count = 0;
+  TJson const failures = ForEachInstance([&](TJson instance) {
+    write(LineOf(std::move(instance)));
+    ++count;
+  });
+  write(LineOf({{"instances", count}, {"instanceFailures", failures}}));
+}
+
 // Writes the elements of the array, and returns the namespaces that failed while they were read.
 TJson TReportDocument::WriteInstances(TWriter const& write) const {
   constexpr std::size_t pieceSize = 65536;
-  TJson failures = TJson::array();
   std::string piece;
   bool isFirst = true;
+  TJson failures = ForEachInstance([&](TJson instance) {
+    if (!std::exchange(isFirst, false)) piece += ',';
+    AppendElement(piece, TextOf(std::move(instance)));
+    if (piece.size() >= pieceSize) write(std::exchange(piece, std::string()));
+  });
+  write(isFirst ? piece : piece + "\n  ");
+  return failures;
+}
+
+// Converts one instance after the other. A namespace that fails is left there and is part of the result; what `use` throws is
+// passed on.
+TJson TReportDocument::ForEachInstance(std::function<void(TJson instance)> const& use) const {
+  TJson failures = TJson::array();
+  if (fPlugIns == nullptr) return failures;
   for (TNamespaceView const& view : ViewsOf(*fPlugIns)) {
     TInstanceJson json(view);
     std::vector<boost::shared_ptr<ICIMInstance>> instances;
     std::string failure = FailureOf([&] { instances = view.AllInstances(); });
     for (auto instance = instances.begin(); instance != instances.end() && failure.empty(); ++instance) {
-      std::string element;
-      failure = FailureOf([&] { element = TextOf(json.Of(**instance)); });
-      if (!failure.empty()) break;
-      if (!std::exchange(isFirst, false)) piece += ',';
-      AppendElement(piece, element);
-      if (piece.size() >= pieceSize) write(std::exchange(piece, std::string()));
+      TJson element;
+      failure = FailureOf([&] { element = json.Of(**instance); });
+      if (failure.empty()) use(std::move(element));
     }
     if (!failure.empty()) failures.push_back({{"provider", view.GetProviderName()}, {"error", failure}});
   }
-  write(isFirst ? piece : piece + "\n  ");
   return failures;
 }
 

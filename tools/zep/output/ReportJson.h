@@ -34,11 +34,17 @@ public:
   // Calls `write` with one piece of the text after the other; the text has the form of AsText. What `write` throws is passed on.
   void Write(TWriter const& write) const;
 
+  // The same as lines, for large machines: all members but the instances, each instance, and at the end the number of instances
+  // and the failures: {"instances":402,"instanceFailures":[]}.
+  void WriteLines(TWriter const& write) const;
+
   std::string Text() const;
 
 private:
   std::string TextOf(TJson json) const;
+  std::string LineOf(TJson json) const;
   TJson WriteInstances(TWriter const& write) const;
+  TJson ForEachInstance(std::function<void(TJson instance)> const& use) const;
 
   EMessages fMessages = EMessages::kWithoutSecrets;
   TJson fMembers;

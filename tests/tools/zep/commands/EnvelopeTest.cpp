@@ -205,6 +205,17 @@ TEST_F(EnvelopeTest, WithoutJsonOrAfterACommandToRunThereIsNoDocument) {
   EXPECT_EQ(Run({"config", "--", "--json"}).fOutput, "");
 }
 
+TEST_F(EnvelopeTest, AReportInLinesBeginsWithItsDocument) {
+  TRun const run = Run({"report", "--format", "jsonl", "--sample"});
+  EXPECT_EQ(run.fStatus, 0);
+  ASSERT_GT(LinesOf(run.fOutput).size(), 50u);
+  ExpectEnvelope(LinesOf(run.fOutput).front(), 0, "zep report");
+  ExpectEnvelope(Run({"report", "--format=jsonl", "--no-such-option"}).fOutput, 64, "zep report");
+  Expect({"zep report", 64, {"report", "--format", "jsonl", "--to-media", "/dev/sdz"}});
+  EXPECT_EQ(Run({"report", "--format", "json", "--sample"}).fStatus, 0);
+  EXPECT_EQ(Run({"report", "--format", "yaml", "--sample"}).fStatus, 64);
+}
+
 TEST_F(EnvelopeTest, EachHostOfAListHasItsOwnDocumentOnOneLine) {
   Write("password", "p\n");
   TRun const run = Run({"remote", "--hosts", "hosts", "--user", "u", "--password-file", "password"});

@@ -30,6 +30,44 @@ TEST(ReportJsonTest, IsWrittenInPieces) {
   EXPECT_EQ(whole, AsText(json)) << "the form differs from that of other documents";
 }
 
+TEST(ReportJsonTest, TheLinesHaveTheDocumentThenEachInstanceThenTheirNumber) {
+  TReport const report = SampleReport();
+  TReportDocument const document(report, EMessages::kWithoutSecrets);
+  std::vector<TJson> lines;
+  document.WriteLines([&lines](std::string const& line) {
+    EXPECT_EQ(line.find('\n'), line.size() - 1);
+    lines.push_back(TJson::parse(line));
+  });
+  TJson whole = TJson::parse(document.Text());
+  TJson const instances = whole["instances"];
+  ASSERT_EQ(lines.size(), instances.size() + 2);
+  for (std::size_t at = 0; at < instances.size(); ++at) EXPECT_EQ(lines[at + 1], instances[at]);
+  EXPECT_EQ(lines.back(), (TJson{{"instances", instances.size()}, {"instanceFailures", TJson::array()}}));
+  whole.erase("instances");
+  EXPECT_EQ(lines.front(), whole);
+}
+
+TJson SectionOf(TJson const& document, std::string const& key) {
+  for (TJson const& section : document["sections"])
+    if (section["key"] == key) return section;
+  return TJson::object();
+}
+
+TEST(ReportJsonTest, HasTheTablesOfTheTextReportAndTheUnits) {
+  TReport const report = SampleReport();
+  TJson const json = TJson::parse(TReportDocument(report, EMessages::kWithoutSecrets).Text());
+  EXPECT_THAT(json["time"].get<std::string>(), testing::MatchesRegex("20[0-9-]{8}T[0-9:]{8}Z"));
+  TJson const memory = SectionOf(json, "memory"), volumes = SectionOf(json, "volumes");
+  EXPECT_EQ(memory["columns"][1], "Size");
+  EXPECT_EQ(memory["rows"][0][1], "16 GiB");
+  EXPECT_EQ(volumes["rows"], TJson::array());
+  EXPECT_TRUE(volumes["whyEmpty"].is_string());
+  for (TJson const& instance : json["instances"])
+    if (instance["class"] == "CIM_PhysicalMemory") {
+      EXPECT_EQ(instance["properties"]["Capacity"]["unit"], "byte");
+    }
+}
+
 TEST(ReportJsonTest, AMemberThatWasAddedIsWritten) {
   TReport const report = SampleReport();
   TReportDocument document(report, EMessages::kVerbatim);

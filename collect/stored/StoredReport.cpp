@@ -1,0 +1,252 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/stored/StoredReport.h"
+
+#include "collect/SafeText.h"
+#include "collect/UnitText.h"
+#include "collect/stored/TStoredNode.h"
+
+#include <algorithm>
+#include <filesystem>
+#include <fstream>
+#include <string_view>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+using TJson = TStoredNode::TJson;
+using TText = TAnswer<std::string>;
+
+constexpr int kVersion = 2;
+
+// ---- Parsing ----
+
+// Refuses what no report contains, before it costs memory or time: the library searches the members of an object one by one.
+class TBounds {
+public:
+  bool Check(int depth, TJson::parse_event_t event) {
+    constexpr int deepest = 16;
+    constexpr std::size_t mostMembers = 2000;
+    if (depth >= deepest) throw TStoredReportError("the document is nested too deeply for a report");
+    std::size_t& members = fMembers[depth];
+    if (event == TJson::parse_event_t::object_start) fMembers[depth + 1] = 0;
+    if (event == TJson::parse_event_t::key && ++members > mostMembers)
+      throw TStoredReportError("an object has more than " + std::to_string(mostMembers) + " members");
+    return true;
+  }
+
+private:
+  std::size_t fMembers[32] = {};
+};
+
+// "parse error at line 3, column 9: ..." without the number of the exception in front of it.
+std::string WhyNotJson(TJson::parse_error const& failure) {
+  std::string_view what = failure.what();
+  if (std::size_t const at = what.find("line "); at != what.npos) what.remove_prefix(at);
+  constexpr std::size_t longest = 200;
+  return Shortened(Printable(what), longest);
+}
+
+TJson Parsed(std::string const& text) {
+  constexpr std::string_view gzip = "\x1f\x8b";
+  if (text.compare(0, gzip.size(), gzip) == 0) throw TStoredReportError("it is compressed; gunzip it first");
+  TBounds bounds;
+  try {
+    return TJson::parse(text, [&](int depth, TJson::parse_event_t event, TJson&) { return bounds.Check(depth, event); });
+  } catch (TJson::parse_error const& failure) {
+    throw TStoredReportError(WhyNotJson(failure));
+  }
+}
+
+// ---- The parts of the document ----
+
+void CheckHead(TStoredNode const& document) {
+  auto const name = document.Optional("document");
+  if (!name || !name->IsString() || name->Text() != "zep report")
+    throw TStoredReportError("it is not a document of zep report --json");
+  TStoredNode const version = document.Member("version");
+  if (!version.Json().is_number_unsigned()) version.Refuse("is not a number");
+  auto const number = version.Json().get<std::uint64_t>();
+  if (number != kVersion)
+    version.Refuse("is " + std::to_string(number) +
+                   (number > kVersion ? ", which a newer zep wrote" : ", which an older zep wrote") +
+                   "; this zep reads version " + std::to_string(kVersion));
+  if (!document.Optional("status")) throw TStoredReportError("it has no report: " + document.TextOrNullOf("reason"));
+}
+
+TMissing MissingOf(TStoredNode const& node) { return {node.TextOf("code"), node.TextOf("reason")}; }
+
+TStoredRow RowOf(TStoredNode const& node) {
+  TStoredNode const value = node.Member("value");
+  std::string const source = node.TextOrNullOf("source");
+  TText answer = value.IsNull() ? TText::Unknown(MissingOf(node), source) : TText::Known(value.Text(), source);
+  if (auto const note = node.Optional("note")) answer.fNote = note->Text();
+  return {node.Name(), node.TextOf("label"), std::move(answer)};
+}
+
+std::vector<TStoredRow> RowsOf(TStoredNode const& node) {
+  std::vector<TStoredRow> rows;
+  node.ForEachMember([&](TStoredNode const& row) { rows.push_back(RowOf(row)); });
+  return rows;
+}
+
+TText CellOf(TStoredNode const& node) {
+  return node.IsString() ? TText::Known(node.Text(), "") : TText::Unknown(MissingOf(node), "");
+}
+
+TStoredSection SectionOf(TStoredNode const& node) {
+  TStoredSection section{node.TextOf("key"), node.TextOf("title"), {}, {}, node.TextOrNullOf("whyEmpty")};
+  section.fColumns = node.Member("columns").Elements([](TStoredNode const& title) { return title.Text(); });
+  section.fRows = node.Member("rows").Elements([&](TStoredNode const& row) {
+    auto cells = row.Elements(CellOf);
+    if (cells.size() != section.fColumns.size()) row.Refuse("has not as many cells as the table has columns");
+    return cells;
+  });
+  return section;
+}
+
+TStoredProblem ProblemOf(TStoredNode const& node) {
+  return {node.TextOf("rule"), node.TextOf("severity"), node.TextOf("reason"), node.TextOrNullOf("remedy"),
+          node.TextOrNullOf("instance")};
+}
+
+TStoredRule RuleOf(TStoredNode const& node) {
+  return {node.TextOf("id"), node.TextOf("question"), node.TextOf("outcome"),
+          node.Member("notExamined").Elements([](TStoredNode const& element) { return element.TextOf("reason"); })};
+}
+
+void AddProviders(TStoredNode const& plugIn, std::vector<TStoredProvider>& providers) {
+  std::string const name = plugIn.TextOf("name"), error = plugIn.TextOrNullOf("error");
+  double const milliseconds = plugIn.Member("milliseconds").Number();
+  if (!error.empty()) providers.push_back({name, "", "", milliseconds, error});
+  plugIn.Member("providers").ForEachElement([&](TStoredNode const& run) {
+    providers.push_back({name, run.TextOf("name"), run.TextOrNullOf("namespace"),
+                         milliseconds + run.Member("milliseconds").Number(), run.TextOrNullOf("error")});
+  });
+}
+
+// ---- Instances ----
+
+// A value that is not an array, as text.
+std::string TextOf(TStoredNode const& node) {
+  TJson const& json = node.Json();
+  if (json.is_structured()) node.Refuse("is not a value");
+  return json.is_string() ? json.get<std::string>() : json.dump();
+}
+
+// The word for the value, or the value with its unit.
+std::string InWords(TStoredNode const& value, TJson const* word, std::string const& unit) {
+  std::string const text = TextOf(value);
+  if (word != nullptr && word->is_string()) return word->get<std::string>();
+  return unit.empty() ? text : TextWithUnit(TCIMValue(text), unit);
+}
+
+std::string InWords(TStoredNode const& value, std::optional<TStoredNode> const& words, std::string const& unit) {
+  if (!value.IsArray()) return InWords(value, words ? &words->Json() : nullptr, unit);
+  std::string text;
+  std::size_t at = 0;
+  value.ForEachElement([&](TStoredNode const& element) {
+    bool const hasWord = words && words->IsArray() && at < words->Json().size();
+    text += (at == 0 ? "" : ", ") + InWords(element, hasWord ? &words->Json()[at] : nullptr, unit);
+    ++at;
+  });
+  return text;
+}
+
+TStoredProperty PropertyOf(TStoredNode const& node) {
+  TStoredProperty property{node.Name(), node.TextOf("type"), node.Optional("key").has_value(), "", "", "", node.TextOf("source"),
+                           {}};
+  if (auto const unit = node.Optional("unit")) property.fUnit = unit->Text();
+  TStoredNode const value = node.Member("value");
+  if (value.IsNull()) {
+    property.fMissing = MissingOf(node);
+    return property;
+  }
+  property.fText = InWords(value, node.Optional("words"), property.fUnit);
+  property.fRaw = value.IsArray() ? value.Json().dump(-1, ' ', false, TJson::error_handler_t::replace) : TextOf(value);
+  return property;
+}
+
+TStoredInstance InstanceOf(TStoredNode const& node) {
+  TStoredInstance instance{node.TextOf("path"), node.TextOf("provider"), node.TextOf("namespace"), node.TextOf("class"), {}};
+  node.Member("properties").ForEachMember([&](TStoredNode const& property) {
+    instance.fProperties.push_back(PropertyOf(property));
+  });
+  return instance;
+}
+
+TStoredReport ReportOf(TStoredNode const& document) {
+  CheckHead(document);
+  TStoredReport report;
+  report.fZep = document.TextOf("zep");
+  if (auto const label = document.Optional("label")) report.fLabel = label->Text();
+  if (auto const time = document.Optional("time")) report.fTime = time->Text();
+  report.fStatus = document.TextOf("status");
+  report.fReason = document.TextOrNullOf("reason");
+  report.fHead = document.Member("head").Elements([](TStoredNode const& line) { return line.Text(); });
+  TStoredNode const findings = document.Member("findings");
+  report.fProblems = findings.Member("problems").Elements(ProblemOf);
+  report.fRules = findings.Member("rules").Elements(RuleOf);
+  report.fIdentity = RowsOf(document.Member("identity"));
+  report.fDetails = RowsOf(document.Member("details"));
+  if (auto const sections = document.Optional("sections")) report.fSections = sections->Elements(SectionOf);
+  document.Member("plugIns").ForEachElement([&](TStoredNode const& plugIn) { AddProviders(plugIn, report.fProviders); });
+  report.fInstances = document.Member("instances").Elements(InstanceOf);
+  return report;
+}
+
+std::string ReadWithinLimit(std::string const& file) {
+  std::error_code error;
+  if (!std::filesystem::exists(file, error)) throw TStoredReportError(error ? error.message() : "no such file");
+  if (!std::filesystem::is_regular_file(file, error)) throw TStoredReportError("it is not a regular file");
+  std::ifstream stream(file, std::ios::binary);
+  std::string text(
+      static_cast<std::size_t>(std::min<std::uintmax_t>(std::filesystem::file_size(file, error), kStoredReportLimit) + 1), '\0');
+  stream.read(text.data(), static_cast<std::streamsize>(text.size()));
+  text.resize(static_cast<std::size_t>(stream.gcount()));
+  if (text.size() > kStoredReportLimit)
+    throw TStoredReportError("it is longer than " + std::to_string(kStoredReportLimit >> 20) +
+                             " MiB, the limit for a stored report");
+  if (stream.bad() || !stream.eof()) throw TStoredReportError("it cannot be read");
+  return text;
+}
+
+}  // namespace
+
+TStoredProperty const* TStoredInstance::Find(std::string const& name) const {
+  auto const found = std::find_if(fProperties.begin(), fProperties.end(),
+                                  [&](TStoredProperty const& property) { return property.fName == name; });
+  return found == fProperties.end() ? nullptr : &*found;
+}
+
+bool TStoredInstance::IsAssociation() const {
+  bool hasKey = false;
+  for (TStoredProperty const& property : fProperties) {
+    if (property.fIsKey && property.fType != "reference") return false;
+    hasKey = hasKey || property.fIsKey;
+  }
+  return hasKey;
+}
+
+TStoredReport StoredReportFrom(std::string const& text, std::string const& name) {
+  try {
+    TJson const document = Parsed(text);
+    TStoredReport report = ReportOf(TStoredNode(document));
+    report.fFile = name;
+    return report;
+  } catch (TStoredReportError const& failure) {
+    throw TStoredReportError(name + ": " + failure.what());
+  }
+}
+
+TStoredReport ReadStoredReport(std::string const& file) {
+  std::string text;
+  try {
+    text = ReadWithinLimit(file);
+  } catch (TStoredReportError const& failure) {
+    throw TStoredReportError(file + ": " + failure.what());
+  }
+  return StoredReportFrom(text, file);
+}
+
+}  // namespace NQRVZEP20
