@@ -39,12 +39,12 @@ private:
   std::size_t fMembers[32] = {};
 };
 
-// "parse error at line 3, column 9: ..." without the number of the exception in front of it.
+// "line 3, column 9: syntax error while parsing value - unexpected end of input": the message without the number of the exception
+// and without the text of the file, which may be a password.
 std::string WhyNotJson(TJson::parse_error const& failure) {
   std::string_view what = failure.what();
   if (std::size_t const at = what.find("line "); at != what.npos) what.remove_prefix(at);
-  constexpr std::size_t longest = 200;
-  return Shortened(Printable(what), longest);
+  return Printable(what.substr(0, what.find("; last read")));
 }
 
 TJson Parsed(std::string const& text) {
@@ -94,8 +94,8 @@ TText CellOf(TStoredNode const& node) {
   return node.IsString() ? TText::Known(node.Text(), "") : TText::Unknown(MissingOf(node), "");
 }
 
-TStoredSection SectionOf(TStoredNode const& node) {
-  TStoredSection section{node.TextOf("key"), node.TextOf("title"), {}, {}, node.TextOrNullOf("whyEmpty")};
+TReportSection SectionOf(TStoredNode const& node) {
+  TReportSection section{node.TextOf("key"), node.TextOf("title"), {}, {}, node.TextOrNullOf("whyEmpty")};
   section.fColumns = node.Member("columns").Elements([](TStoredNode const& title) { return title.Text(); });
   section.fRows = node.Member("rows").Elements([&](TStoredNode const& row) {
     auto cells = row.Elements(CellOf);

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "Missing.h"
+#include "collect/Sections.h"
 #include "collect/TAnswer.h"
 
 #include <cstddef>
@@ -47,13 +48,6 @@ struct TStoredRow {
   TAnswer<std::string> fAnswer;
 };
 
-struct TStoredSection {
-  std::string fKey, fTitle;
-  std::vector<std::string> fColumns;
-  std::vector<std::vector<TAnswer<std::string>>> fRows;  // a cell for each column
-  std::string fWhyEmpty;
-};
-
 struct TStoredProblem {
   std::string fRule, fSeverity, fReason, fRemedy, fInstance;  // remedy and instance may be empty
 };
@@ -81,7 +75,7 @@ struct TStoredReport {
   std::vector<TStoredProblem> fProblems;
   std::vector<TStoredRule> fRules;
   std::vector<TStoredRow> fIdentity, fDetails;
-  std::vector<TStoredSection> fSections;    // none if the document does not have them
+  std::vector<TReportSection> fSections;    // none if the document does not have them
   std::vector<TStoredProvider> fProviders;  // a plug-in that failed has one without a name
   std::vector<TStoredInstance> fInstances;
 };

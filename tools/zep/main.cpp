@@ -33,6 +33,7 @@ constexpr char const* kIsEmpty = " must not be empty";
 
 constexpr TCommand kCommands[] = {
     {"report", "Report the identity and the hardware of this machine", AddReportArguments},
+    {"diff", "Compare two stored reports", AddDiffArguments},
     {"show", "Print one object or class of the providers' namespaces, or of a MOF file", AddShowArguments},
     {"classes", "List the classes of the providers' namespaces, or of a MOF file", AddClassesArguments},
     {"plugins", "List the plug-ins, and why files are not loaded as plug-ins", AddPluginsArguments},

@@ -108,6 +108,9 @@ TEST(StoredReportTest, ACutDocumentIsRefusedAtEveryPlace) {
 
 TEST(StoredReportTest, ForeignBytesAreRefused) {
   EXPECT_EQ(WhyTextRefused("\x1f\x8b\x08"), "a.json: it is compressed; gunzip it first");
+  EXPECT_EQ(WhyTextRefused("\"secret\n"),
+            "a.json: line 2, column 0: syntax error while parsing value - invalid string: control character U+000A (LF) must be "
+            "escaped to \\u000A or \\n");
   EXPECT_EQ(WhyTextRefused("[]"), "a.json: the document is not an object");
   EXPECT_EQ(WhyTextRefused("{}"), "a.json: it is not a document of zep report --json");
   EXPECT_EQ(WhyTextRefused("\x7f"

@@ -30,6 +30,7 @@ constexpr char const* kListMedia = "list";
 
 TRun AddClassesArguments(CLI::App& command);     // ClassesCommand.cpp
 TRun AddConfigArguments(CLI::App& command);      // ConfigCommand.cpp
+TRun AddDiffArguments(CLI::App& command);        // DiffCommand.cpp
 TRun AddDoctorArguments(CLI::App& command);      // DoctorCommand.cpp
 TRun AddGetArguments(CLI::App& command);         // GetCommand.cpp
 TRun AddHelpArguments(CLI::App& command);        // HelpCommand.cpp

@@ -5,6 +5,7 @@
 #include "collect/Report.h"
 #include "tools/zep/commands/Commands.h"
 #include "tools/zep/commands/Providers.h"
+#include "tools/zep/commands/StoredReports.h"
 #include "tools/zep/commands/Thresholds.h"
 #include "tools/zep/media/TMountedMedium.h"
 #include "tools/zep/output/FindingsText.h"
@@ -40,8 +41,11 @@ struct TArguments {
   TTransferOptions fOptions;
   TPlugInArguments fPlugIns;
   TReportParts fParts;
-  std::string fFailOn;  // a severity; empty for none
-  std::string fMedium;  // the device to write to; empty for standard output
+  std::string fFailOn;    // a severity; empty for none
+  std::string fFrom;      // a stored report; empty for this machine
+  std::string fSince;     // a stored report to compare with; empty for none
+  std::string fHtmlFile;  // the page to write; empty for none
+  std::string fMedium;    // the device to write to; empty for standard output
 };
 
 // Whether the findings make the command fail.
@@ -92,8 +96,9 @@ TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
 // Returns the document of the report, or of the medium to which it was written. Without --json the report is printed here.
 TReportDocument PrintOrWrite(TReport const& report, TArguments const& arguments) {
   if (!arguments.fMedium.empty()) return TReportDocument(WriteToMedium(report, arguments));
+  if (!arguments.fHtmlFile.empty()) PrintOrWritePage(AsStored(report), arguments.fHtmlFile);
   if (arguments.fAsJson) return TReportDocument(report, EMessages::kWithoutSecrets);
-  WriteOutput(ReportAsText(report, arguments.fParts));
+  if (arguments.fHtmlFile.empty()) WriteOutput(ReportAsText(report, arguments.fParts));
   return TReportDocument(TJson());
 }
 
@@ -136,6 +141,19 @@ int Deliver(TReport const& report, TTarget const& target, TArguments const& argu
   return status;
 }
 
+int ReportFrom(TArguments const& arguments) {
+  TStoredReport const report = ReadReport(arguments.fFrom);
+  PrintOrWritePage(report, arguments.fHtmlFile);
+  return StatusOf(report);
+}
+
+int ReportSince(TArguments const& arguments) {
+  TStoredReport const before = ReadReport(arguments.fSince);
+  auto const sample = SampleIf(arguments.fSample);
+  TReport const report = MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample, {ThresholdSettings()});
+  return PrintDifferences("zep report --since", before, AsStored(report), {arguments.fAsJson, arguments.fHtmlFile});
+}
+
 // Prints the message of an interrupted run itself: the signal ends zep when `guard` ends.
 int Report(TArguments const& arguments) {
   std::optional<TSample> sample;
@@ -155,6 +173,21 @@ int Report(TArguments const& arguments) {
     std::cerr << "zep: " << Printable(failure.what()) << "\n";
     return StatusOf(failure);
   }
+}
+
+// With a stored report, no option may say how to make or deliver one.
+void AddStoredOptions(CLI::App& command, TArguments& arguments) {
+  auto* const from = command.add_option("--from", arguments.fFrom, "Print this stored report, the output of zep report --json");
+  auto* const since =
+      command.add_option("--since", arguments.fSince, "Print only what changed since this stored report, like zep diff");
+  from->type_name("FILE")->excludes(since);
+  since->type_name("FILE");
+  for (char const* other : {"--section", "--full", "--format", "--to-media", "--send", "--fail-on"}) {
+    from->excludes(command.get_option(other));
+    since->excludes(command.get_option(other));
+  }
+  for (char const* other : {"--json", "--sample", "--plugin"}) from->excludes(command.get_option(other));
+  command.get_option("--html")->excludes(command.get_option("--to-media"));
 }
 
 }  // namespace
@@ -195,14 +228,23 @@ TRun AddReportArguments(CLI::App& command) {
       ->check(
           CLI::IsMember({"information", "warning", "error", "critical"}).description("information, warning, error or critical"))
       ->type_name("SEVERITY");
+  command
+      .add_option("--html", arguments->fHtmlFile,
+                  "Write the report as a page to this file, which needs no other file, instead of printing it as text")
+      ->type_name("FILE");
   AddUploadOptions(command, arguments->fOptions);
   AddPlugInOptions(command, arguments->fPlugIns);
+  AddStoredOptions(command, *arguments);
   command.footer(
       "Exit status: 0 when the identity is complete, even if details are missing, 2 when part of the identity is missing or\n"
       "a plug-in failed, 3 when a finding is as severe as --fail-on says or worse, 1 when none of it is known or the medium\n"
       "could not be mounted, written or unmounted, 64 for wrong usage; when the report could not be sent, the exit status\n"
-      "of zep send.");
-  return [arguments] { return Report(*arguments); };
+      "of zep send. With --from it is that of the stored report, with --since that of zep diff; 66 when the stored report is\n"
+      "refused, 73 when the page cannot be written.");
+  return [arguments] {
+    if (!arguments->fFrom.empty()) return ReportFrom(*arguments);
+    return arguments->fSince.empty() ? Report(*arguments) : ReportSince(*arguments);
+  };
 }
 
 }  // namespace NQRVZEP20::zep

@@ -13,11 +13,11 @@ enum EExitStatus {
   kExitFindings = 3,  // everything was done, but zep report found a problem of the severity given by --fail-on, or a worse one
   kExitUsage = 64,    // wrong usage
 
-  // Only for transfers, which end with kExitNothing if the server refuses them or they fail halfway:
-  kExitNoInput = 66,       // the file to send cannot be read
+  // For transfers, which end with kExitNothing if the server refuses them or they fail halfway:
+  kExitNoInput = 66,       // the file to send cannot be read; also: a stored report is refused
   kExitNoConnection = 68,  // the host is unknown or does not answer
   kExitNoLibrary = 69,     // libcurl is missing or unsuitable
-  kExitNotWritten = 73,    // the local file exists already, or cannot be written
+  kExitNotWritten = 73,    // the local file exists already, or cannot be written; also: a page
   kExitStalled = 75,       // no data moved for too long
 
   // Only in documents: zep is killed by the signal that interrupted it, which a shell reports as this number.

@@ -2,6 +2,7 @@
 
 // The exit status and the JSON document of every command of zep, when it succeeds and when it fails.
 
+#include "tests/collect/stored/StoredDocument.h"
 #include "tests/tools/zep/Envelope.h"
 #include "tests/tools/zep/Zep.h"
 
@@ -29,6 +30,8 @@ protected:
     Write("bad.mof", "class\n");
     Write("there", "");
     Write("hosts", "one\ntwo\n");
+    Write("a.json", StoredDocument());
+    Write("b.json", StoredDocumentWith("db1", "db2"));
   }
 
   void Write(std::string const& name, std::string const& text) { WriteFile(fZep.Path("work/" + name), text); }
@@ -104,6 +107,13 @@ TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
       {"zep report", 64, {"report", "--json", "--sample", "--send", "ftp://127.0.0.1:1/d/", "--netrc", "/nowhere"}},
       {"zep report", 2, {"report", "--json"}},
       {"zep report --to-media", 1, {"report", "--json", "--sample", "--to-media", "/dev/no-such-device"}},
+      {"zep report", 64, {"report", "--format", "json", "--since", "there"}},
+      {"zep report", 66, {"report", "--json", "--since", "there"}},
+      {"zep report", 64, {"report", "--json", "--from", "a.json"}},
+      {"zep diff", 66, {"diff", "--json", "there", "there"}},
+      {"zep diff", 1, {"diff", "--json", "a.json", "b.json"}},
+      {"zep diff", 73, {"diff", "--json", "a.json", "b.json", "--html", "/nowhere/page"}},
+      {"zep report --since", 1, {"report", "--json", "--sample", "--since", "a.json"}},
       {"zep show", 1, {"show", "X_None", "--json"}},
       {"zep show", 1, {"show", "X_None", "--json", "--mof", "bad.mof"}},
       {"zep classes", 1, {"classes", "--json", "--mof", "/nowhere"}},
@@ -158,6 +168,7 @@ TEST_F(EnvelopeTest, WpadWithoutPermissionToListenPrintsADocument) {
 TEST_F(EnvelopeTest, EveryCommandThatSucceedsPrintsADocumentWithItsExitStatus) {
   TRow const rows[] = {
       {"zep report", 0, {"report", "--json", "--sample"}},
+      {"zep diff", 0, {"diff", "--json", "a.json", "a.json"}},
       {"zep show", 0, {"show", "CIM_Chassis", "--json", "--sample"}},
       {"zep show", 0, {"show", "X_A", "--json", "--mof", "good.mof"}},
       {"zep classes", 0, {"classes", "--json", "--sample"}},
@@ -211,7 +222,7 @@ TEST_F(EnvelopeTest, AReportInLinesBeginsWithItsDocument) {
   ASSERT_GT(LinesOf(run.fOutput).size(), 50u);
   ExpectEnvelope(LinesOf(run.fOutput).front(), 0, "zep report");
   ExpectEnvelope(Run({"report", "--format=jsonl", "--no-such-option"}).fOutput, 64, "zep report");
-  Expect({"zep report", 64, {"report", "--format", "jsonl", "--to-media", "/dev/sdz"}});
+  Expect({"zep report --to-media", 64, {"report", "--format", "jsonl", "--to-media", "/dev/sdz"}});
   EXPECT_EQ(Run({"report", "--format", "json", "--sample"}).fStatus, 0);
   EXPECT_EQ(Run({"report", "--format", "yaml", "--sample"}).fStatus, 64);
 }

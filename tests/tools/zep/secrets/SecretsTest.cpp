@@ -180,6 +180,11 @@ TEST_F(WrongPlaceTest, NoArgumentOfAnyCommandIsPrintedWithItsPassword) {
       {{"report", "--stall", "@"}, "1"},
       {{"report", "--clean-up", "@"}, "1"},
       {{"report", "@"}},
+      {{"report", "--from", "@", "--html", "@"}},
+      {{"report", "--json", "--since", "@"}},
+      {{"report", "--format", "@"}},
+      {{"diff", "@", "@"}},
+      {{"diff", "--json", "@", "@", "--html", "@"}},
       {{"show", "@"}},
       {{"show", "--json", "@"}},
       {{"show", "--mof", "@", "@"}},
@@ -245,6 +250,8 @@ TEST_F(WrongPlaceTest, NoFileIsPrintedWithItsPassword) {
     ExpectHidden({"remote", "--hosts", file, "--user", "u", "--debug-log", log});
     ExpectHidden({"remote", "h", "--user", "u", "--password-file", file, "--debug-log", log});
     ExpectHidden({"mof", file});
+    ExpectHidden({"report", "--from", file});
+    ExpectHidden({"diff", "--json", File("quoted", "\"" + text + "\n"), file});
     ExpectHidden({"mof", "--json", file});
     ExpectHidden({"classes", "--mof", file});
     ExpectHidden({"show", "X", "--mof", file});

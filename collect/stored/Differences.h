@@ -1,0 +1,45 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "collect/stored/StoredReport.h"
+
+#include <string>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+// A value that two reports give differently, as text with units or words; the reason where a value is missing.
+struct TChange {
+  std::string fName;  // of the property or the row
+  std::string fBefore, fAfter;
+};
+
+// An object that only one of two reports has, or that has changed.
+struct TObjectDifference {
+  enum class EKind { kGone, kAppeared, kChanged };
+
+  EKind fKind;
+  std::string fClass, fPath;
+  std::string fName;              // for people (ObjectName.h)
+  std::vector<TChange> fChanges;  // only of a changed object
+};
+
+struct TDifferences {
+  std::vector<TObjectDifference> fObjects;  // those that are gone, then those that appeared, then those that changed
+  std::vector<TChange> fRows;               // of the identity and the details
+  std::vector<TStoredProblem> fNewProblems, fSolvedProblems;
+  std::vector<std::string> fNotCompared;  // why: "provider Storage failed in b.json: no disk"
+
+  bool IsSame() const;
+};
+
+// For programs: "gone", "appeared" and "changed".
+std::string NameOf(TObjectDifference::EKind kind);
+
+// Compares two reports, object by object; objects are the same if they have the same path, and so the same class and keys.
+// Ignored are relations between objects, records of missing values, and what always changes: times, free space, load and traffic
+// (counters of errors are compared), and readings of sensors within their hysteresis, or within a tenth if they state none. The
+// objects of a provider that failed in one of the reports, or does not exist there, are not compared.
+TDifferences DifferencesOf(TStoredReport const& before, TStoredReport const& after);
+
+}  // namespace NQRVZEP20

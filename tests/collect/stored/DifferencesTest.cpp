@@ -1,0 +1,117 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/stored/Differences.h"
+
+#include "tests/Support.h"
+#include "tests/collect/stored/StoredDocument.h"
+
+namespace NQRVZEP20 {
+namespace {
+
+TStoredReport Before() { return StoredReportFrom(StoredDocument(), "a.json"); }
+
+TStoredReport With(std::string const& from, std::string const& to) {
+  return StoredReportFrom(StoredDocumentWith(from, to), "b.json");
+}
+
+// A report whose first instance is a sensor of that class with one reading.
+TStoredReport WithProperty(std::string const& cls, std::string const& name, std::string const& value,
+                           std::string const& more = "") {
+  TStoredReport report = Before();
+  TStoredInstance& instance = report.fInstances.front();
+  instance.fClass = cls;
+  instance.fProperties.push_back({name, "uint32", false, value, value, "", "", {}});
+  if (!more.empty()) instance.fProperties.push_back({"Hysteresis", "uint32", false, more, more, "", "", {}});
+  return report;
+}
+
+TEST(DifferencesTest, EqualReportsAreTheSame) {
+  TDifferences const differences = DifferencesOf(Before(), Before());
+  EXPECT_TRUE(differences.IsSame());
+  EXPECT_TRUE(differences.fNotCompared.empty());
+}
+
+TEST(DifferencesTest, AnObjectThatIsGoneHasItsNameAndItsReverseAppeared) {
+  TStoredReport const before = Before(), after = With("Tag=\\\"1\\\"", "Tag=\\\"7\\\"");
+  TDifferences const differences = DifferencesOf(before, after);
+  ASSERT_EQ(differences.fObjects.size(), 2u);
+  EXPECT_EQ(NameOf(differences.fObjects[0].fKind), "gone");
+  EXPECT_EQ(differences.fObjects[0].fName, "DIMM 1 (16 GiB)");
+  EXPECT_EQ(differences.fObjects[0].fClass, "CIM_PhysicalMemory");
+  EXPECT_EQ(NameOf(differences.fObjects[1].fKind), "appeared");
+  EXPECT_EQ(differences.fObjects[1].fPath, "root/x:CIM_PhysicalMemory.Tag=\"7\"");
+}
+
+TEST(DifferencesTest, AChangeHasWordsAndUnits) {
+  struct {
+    char const *fFrom, *fTo, *fName, *fBefore, *fAfter;
+  } const rows[] = {
+      {"17179869184", "34359738368", "Capacity", "16 GiB", "32 GiB"},
+      {"17179869184", "17179869185", "Capacity", "17179869184", "17179869185"},
+      {"26, \"words\": \"DDR4\"", "34, \"words\": \"DDR5\"", "MemoryType", "DDR4", "DDR5"},
+      {"\"value\": 1.25,", "\"value\": null, \"code\": \"x\", \"reason\": \"none\",", "Voltage", "1.25", "unknown (none)"},
+  };
+  for (auto const& row : rows) {
+    TDifferences const differences = DifferencesOf(Before(), With(row.fFrom, row.fTo));
+    ASSERT_EQ(differences.fObjects.size(), 1u) << row.fTo;
+    ASSERT_EQ(differences.fObjects[0].fChanges.size(), 1u);
+    EXPECT_EQ(differences.fObjects[0].fChanges[0].fName, row.fName);
+    EXPECT_EQ(differences.fObjects[0].fChanges[0].fBefore, row.fBefore);
+    EXPECT_EQ(differences.fObjects[0].fChanges[0].fAfter, row.fAfter);
+  }
+}
+
+TEST(DifferencesTest, RowsAndProblemsAreCompared) {
+  TDifferences const rows = DifferencesOf(Before(), With("\"value\": \"db1\"", "\"value\": \"db2\""));
+  ASSERT_EQ(rows.fRows.size(), 1u);
+  EXPECT_EQ(rows.fRows[0].fName, "Host name");
+  EXPECT_EQ(rows.fRows[0].fAfter, "db2");
+  TStoredReport healthy = Before();
+  healthy.fProblems.clear();
+  EXPECT_EQ(DifferencesOf(healthy, Before()).fNewProblems.at(0).fRule, "disk-failing");
+  EXPECT_EQ(DifferencesOf(Before(), healthy).fSolvedProblems.at(0).fRule, "disk-failing");
+  EXPECT_TRUE(DifferencesOf(Before(), With("sda is failing", "sda is failing for 7 hours")).IsSame());
+}
+
+TEST(DifferencesTest, WithinWhatAlwaysChangesReportsAreTheSame) {
+  struct {
+    char const *fClass, *fProperty, *fBefore, *fAfter, *fHysteresis;
+    bool fIsSame;
+  } const rows[] = {
+      {"ZEP_RunningState", "Uptime", "1", "2", "", true},
+      {"CIM_OperatingSystem", "FreePhysicalMemory", "1", "2", "", true},
+      {"ZEP_InterfaceStatistics", "BytesReceived", "1", "2", "", true},
+      {"ZEP_InterfaceStatistics", "ReceiveErrors", "1", "2", "", false},
+      {"CIM_NumericSensor", "CurrentReading", "40", "44", "", true},
+      {"CIM_NumericSensor", "CurrentReading", "40", "45", "", false},
+      {"CIM_NumericSensor", "CurrentReading", "40", "42", "2", true},
+      {"CIM_NumericSensor", "CurrentReading", "40", "43", "2", false},
+      {"CIM_NumericSensor", "CurrentState", "1", "2", "", false},
+      {"ZEP_MissingValue", "Reason", "1", "2", "", true},
+  };
+  for (auto const& row : rows) {
+    TStoredReport const before = WithProperty(row.fClass, row.fProperty, row.fBefore, row.fHysteresis),
+                        after = WithProperty(row.fClass, row.fProperty, row.fAfter, row.fHysteresis);
+    EXPECT_EQ(DifferencesOf(before, after).IsSame(), row.fIsSame) << row.fProperty << " " << row.fAfter;
+  }
+}
+
+TEST(DifferencesTest, RelationsAreNotCompared) {
+  EXPECT_TRUE(DifferencesOf(Before(), With("CIM_Realizes.A", "CIM_Realizes.B")).IsSame());
+}
+
+TEST(DifferencesTest, ObjectsOfAProviderThatFailedAreNotCompared) {
+  TStoredReport failed = Before();
+  failed.fFile = "b.json";
+  failed.fInstances.clear();
+  failed.fProviders[0].fError = "no table";
+  for (bool const isReverse : {false, true}) {
+    TDifferences const differences = isReverse ? DifferencesOf(failed, Before()) : DifferencesOf(Before(), failed);
+    EXPECT_TRUE(differences.IsSame());
+    EXPECT_EQ(differences.fNotCompared, (std::vector<std::string>{"provider Host failed in b.json: no table"}));
+  }
+  failed.fProviders.clear();
+  EXPECT_EQ(DifferencesOf(Before(), failed).fNotCompared.at(0), "provider Host does not exist in b.json");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20

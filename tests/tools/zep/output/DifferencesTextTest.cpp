@@ -1,0 +1,44 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/zep/output/DifferencesText.h"
+
+#include "tests/collect/stored/StoredDocument.h"
+
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+TStoredReport Before() { return StoredReportFrom(StoredDocument(), "a.json"); }
+
+TStoredReport With(std::string const& from, std::string const& to) {
+  return StoredReportFrom(StoredDocumentWith(from, to), "b.json");
+}
+
+std::string TextOf(TStoredReport const& after) { return DifferencesAsText(DifferencesOf(Before(), after)); }
+
+TEST(DifferencesTextTest, EachDifferenceIsOneLine) {
+  EXPECT_EQ(TextOf(Before()), "no differences\n");
+  EXPECT_EQ(TextOf(With("\"16 GiB\", \"source\"", "\"32 GiB\", \"source\"")), "changed: Memory: 16 GiB -> 32 GiB\n");
+  EXPECT_EQ(TextOf(With("\"DDR4\"", "\"DDR4\\n\"")), "no differences\n") << "the word, not the value, differs";
+  EXPECT_EQ(TextOf(With("26, \"words\": \"DDR4\"", "34, \"words\": \"DDR5\\u001b\"")),
+            "changed: CIM_PhysicalMemory DIMM 1 (16 GiB): MemoryType: DDR4 -> DDR5\\x1b\n");
+  TStoredReport gone = Before();
+  gone.fInstances.erase(gone.fInstances.begin());
+  gone.fProblems.clear();
+  EXPECT_EQ(TextOf(gone), "solved problem: error: the disk sda is failing\ngone: CIM_PhysicalMemory DIMM 1 (16 GiB)\n");
+}
+
+TEST(DifferencesTextTest, TheDocumentHasBothSidesAndTheCounts) {
+  TStoredReport gone = Before();
+  gone.fInstances.erase(gone.fInstances.begin());
+  TDifferences const differences = DifferencesOf(Before(), gone);
+  EXPECT_EQ(CountsOf(differences), "1 gone");
+  TJson const document = DifferencesAsJson("zep diff", kExitNothing, differences, Before(), gone);
+  EXPECT_EQ(document["reason"], "the reports differ: 1 gone");
+  EXPECT_EQ(document["before"], (TJson{{"file", "a.json"}, {"time", "2026-11-23T04:05:06Z"}}));
+  EXPECT_EQ(document["objects"][0]["kind"], "gone");
+  EXPECT_EQ(document["objects"][0]["path"], "root/x:CIM_PhysicalMemory.Tag=\"1\"");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

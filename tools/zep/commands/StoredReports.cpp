@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/zep/commands/StoredReports.h"
+
+#include "tools/zep/html/DifferencesHtml.h"
+#include "tools/zep/html/ReportHtml.h"
+#include "tools/zep/output/DifferencesText.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/output/Output.h"
+#include "tools/zep/output/OutputFile.h"
+#include "tools/zep/output/ReportJson.h"
+#include "tools/zep/output/StoredReportText.h"
+
+namespace NQRVZEP20::zep {
+
+TStoredReport ReadReport(std::string const& file) {
+  try {
+    return ReadStoredReport(file);
+  } catch (TStoredReportError const& failure) {
+    throw TFailure(kExitNoInput, failure.what());
+  }
+}
+
+TStoredReport AsStored(TReport const& report) {
+  return StoredReportFrom(TReportDocument(report, EMessages::kWithoutSecrets).Text(), "this report");
+}
+
+EExitStatus StatusOf(TStoredReport const& report) {
+  return report.fStatus == "complete" ? kExitComplete : report.fStatus == "partial" ? kExitPartial : kExitNothing;
+}
+
+void PrintOrWritePage(TStoredReport const& report, std::string const& file) {
+  if (file.empty())
+    WriteOutput(StoredReportAsText(report));
+  else
+    WriteOutputFile(file, ReportAsHtml(report));
+}
+
+EExitStatus PrintDifferences(std::string const& document, TStoredReport const& before, TStoredReport const& after,
+                             TDifferenceOutput const& output) {
+  TDifferences const differences = DifferencesOf(before, after);
+  EExitStatus const status = !differences.IsSame()              ? kExitNothing
+                             : differences.fNotCompared.empty() ? kExitComplete
+                                                                : kExitPartial;
+  if (!output.fHtmlFile.empty()) WriteOutputFile(output.fHtmlFile, DifferencesAsHtml(differences, before, after));
+  if (output.fAsJson)
+    WriteOutput(AsText(DifferencesAsJson(document, status, differences, before, after)));
+  else if (output.fHtmlFile.empty())
+    WriteOutput(DifferencesAsText(differences));
+  return status;
+}
+
+}  // namespace NQRVZEP20::zep

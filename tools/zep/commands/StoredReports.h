@@ -1,0 +1,36 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "collect/Report.h"
+#include "collect/stored/Differences.h"
+#include "collect/stored/StoredReport.h"
+#include "tools/zep/output/ExitStatus.h"
+
+#include <string>
+
+namespace NQRVZEP20::zep {
+
+// Reads a stored report (ReadStoredReport). Throws TFailure with kExitNoInput if it is refused.
+TStoredReport ReadReport(std::string const& file);
+
+// The report as it would be read back from its document.
+TStoredReport AsStored(TReport const& report);
+
+// The exit status of the report, which its document states: kExitComplete, kExitPartial or kExitNothing.
+EExitStatus StatusOf(TStoredReport const& report);
+
+// Writes the report as a page to `file`, or prints it as text if that is empty. Throws like WriteOutputFile.
+void PrintOrWritePage(TStoredReport const& report, std::string const& file);
+
+struct TDifferenceOutput {
+  bool fAsJson = false;
+  std::string fHtmlFile;  // empty: no page
+};
+
+// Prints the differences of two reports as text or as a document named `document`, or writes them as a page. Returns
+// kExitComplete if there are none, kExitNothing if there are some, and kExitPartial if there are none but not everything could be
+// compared.
+EExitStatus PrintDifferences(std::string const& document, TStoredReport const& before, TStoredReport const& after,
+                             TDifferenceOutput const& output);
+
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,54 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/zep/output/OutputFile.h"
+
+#include "core/Handles.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/processes/WriteWhole.h"
+
+#include <stdlib.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+[[noreturn]] void Throw(std::string const& file, std::string const& why) {
+  throw TFailure(kExitNotWritten, file + " cannot be written: " + why);
+}
+
+void CheckTarget(std::string const& file) {
+  struct stat target {};
+  if (::lstat(file.c_str(), &target) == 0 && !S_ISREG(target.st_mode)) Throw(file, "it is not a regular file");
+}
+
+// The mode of a new file, as the shell would make it.
+mode_t UsualMode() {
+  mode_t const mask = ::umask(0);
+  ::umask(mask);
+  return 0666 & ~mask;
+}
+
+bool WriteAndRename(int draft, std::string const& name, std::string const& file, std::string const& text) {
+  return WriteWhole(draft, text) && ::fchmod(draft, UsualMode()) == 0 && ::fsync(draft) == 0 &&
+         std::rename(name.c_str(), file.c_str()) == 0;
+}
+
+}  // namespace
+
+void WriteOutputFile(std::string const& file, std::string const& text) {
+  CheckTarget(file);
+  std::string name = file + ".XXXXXX";
+  TUniqueFd const draft(::mkstemp(name.data()));
+  if (!draft) Throw(file, std::strerror(errno));
+  if (WriteAndRename(draft.get(), name, file, text)) return;
+  int const error = errno;
+  ::unlink(name.c_str());
+  Throw(file, std::strerror(error));
+}
+
+}  // namespace NQRVZEP20::zep
