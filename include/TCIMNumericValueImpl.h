@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
-#pragma once
+#include "TCIMValueImpl.h"  // leads to this header again, which is why the guard stands below it
 
-#include "TCIMValueImpl.h"
+#ifndef ZEP_TCIM_NUMERIC_VALUE_IMPL_H
+#define ZEP_TCIM_NUMERIC_VALUE_IMPL_H
 
 namespace NQRVZEP20 {
 
@@ -9,13 +10,13 @@ namespace NQRVZEP20 {
 // other conversion throws kZEPStatusTypeMismatch.
 class ZEP_EXPORT TCIMNumericValueImpl : public TCIMValueImpl {
 public:
-  TCIMNumericValueImpl(bool value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeBoolean), fBoolean(value) {}
-  TCIMNumericValueImpl(unsigned char value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint8), fUint8(value) {}
-  TCIMNumericValueImpl(signed char value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint8), fSint8(value) {}
-  TCIMNumericValueImpl(unsigned short value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint16), fUint16(value) {}
-  TCIMNumericValueImpl(short value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint16), fSint16(value) {}
-  TCIMNumericValueImpl(unsigned int value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint32), fUint32(value) {}
-  TCIMNumericValueImpl(int value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint32), fSint32(value) {}
+  TCIMNumericValueImpl(bool value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeBoolean), fUint64(value) {}
+  TCIMNumericValueImpl(unsigned char value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint8), fUint64(value) {}
+  TCIMNumericValueImpl(signed char value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint8), fSint64(value) {}
+  TCIMNumericValueImpl(unsigned short value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint16), fUint64(value) {}
+  TCIMNumericValueImpl(short value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint16), fSint64(value) {}
+  TCIMNumericValueImpl(unsigned int value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint32), fUint64(value) {}
+  TCIMNumericValueImpl(int value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint32), fSint64(value) {}
   TCIMNumericValueImpl(unsigned long value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeUint64), fUint64(value) {}
   TCIMNumericValueImpl(long value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeSint64), fSint64(value) {}
   TCIMNumericValueImpl(float value) noexcept : fType(TCIMValue::TCIMType::kCIMTypeReal32), fReal32(value) {}
@@ -49,13 +50,21 @@ public:
 
 private:
   friend class TCIMArrayValueImpl;
+  friend class TCIMValue;
+
+  // Like ==, with a number of the same type.
+  bool EqualsNumber(TCIMNumericValueImpl const& other) const noexcept {
+    if (fType == TCIMValue::TCIMType::kCIMTypeReal64) return fReal64 == other.fReal64;
+    if (fType == TCIMValue::TCIMType::kCIMTypeReal32) return fReal32 == other.fReal32;
+    return fUint64 == other.fUint64;
+  }
 
   // Like ToString, but writes the text to `place`, which has room for 32 bytes, and returns the end of the text.
   char* PutText(char* place, unsigned char radix) const;
 
 protected:
   TCIMValue::TCIMType fType;  // kCIMTypeBoolean to kCIMTypeReal64
-  union {                     // only the member that fType selects is set
+  union {                     // the member that fType selects; integers are stored as 64 bits
     bool fBoolean;
     unsigned char fUint8;
     signed char fSint8;
@@ -71,3 +80,5 @@ protected:
 };
 
 }  // namespace NQRVZEP20
+
+#endif

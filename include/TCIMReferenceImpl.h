@@ -70,11 +70,12 @@ private:
   boost::shared_ptr<ICIMPropertyDecl const> ReadDeclaration(std::string const& path, std::string const& name) const;
   TCIMValue ReadReference(boost::shared_ptr<ICIMNamespace> const& ns, std::string const& path, std::size_t& pos) const;
 
+  // The first two are what comparisons read.
+  boost::shared_ptr<ICIMClass> fClass;           // empty until set; fixed while there are keys
+  TKeyBindings fKeys;                            // by name, in byte order
   std::reference_wrapper<TCIMReference> fOwner;  // passed to the namespace when the instance is looked up
   boost::weak_ptr<ICIMNamespace> fNamespace;
   TCIMContext fContext;                     // passed to the namespace when a class is looked up
-  boost::shared_ptr<ICIMClass> fClass;      // empty until set; fixed while there are keys
-  TKeyBindings fKeys;                       // by name, in byte order
   boost::shared_ptr<ICIMElement> fElement;  // the instance, once found; never looked up again
   std::string fNamespaceName;               // the caller's label; unrelated to fNamespace
   int fDepth = 0;                           // the number of paths being read that enclose this one

@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
-#pragma once
+#include "TCIMValueImpl.h"  // leads to this header again, which is why the guard stands below it
 
-#include "TCIMValueImpl.h"
+#ifndef ZEP_TCIM_STRING_VALUE_IMPL_H
+#define ZEP_TCIM_STRING_VALUE_IMPL_H
 
 namespace NQRVZEP20 {
 
@@ -24,7 +25,11 @@ public:
   bool operator<(TCIMValue const& other) const override;
 
 private:
+  friend class TCIMValue;
+
   std::string fText;
 };
 
 }  // namespace NQRVZEP20
+
+#endif

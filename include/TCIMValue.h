@@ -17,7 +17,9 @@ namespace NQRVZEP20 {
 
 class ICIMClass;
 class ICIMNamespace;
+class TCIMNumericValueImpl;
 class TCIMReference;
+class TCIMStringValueImpl;
 class TCIMValueImpl;
 
 // One typed CIM value. Every property value, method argument, key value and array element that crosses the library's
@@ -106,9 +108,7 @@ public:
 
   TCIMValue(TCIMValue const& other);
   TCIMValue(TCIMValue&& other) noexcept;  // leaves `other` in the default state
-  ~TCIMValue() {
-    if (OwnsMemory()) DestroyData();
-  }
+  ~TCIMValue();
 
   // ---- Assignment ----
 
@@ -205,17 +205,28 @@ public:
 private:
   friend class TCIMValueImpl;
 
+  bool IsNumber() const noexcept { return fType >= TCIMType::kCIMTypeBoolean && fType <= TCIMType::kCIMTypeReal64; }
+  bool HoldsNumber() const noexcept { return fData != nullptr && IsNumber(); }
+  bool HoldsString() const noexcept { return fData != nullptr && fType == TCIMType::kCIMTypeString; }
+  TCIMNumericValueImpl const& Number() const noexcept;  // of a value that holds one
+  TCIMStringValueImpl const& String() const noexcept;   // of a value that holds one
+
+  template <class TSource>
+  TCIMValueImpl* NewNumber(TSource const& source) noexcept;
+  template <class TSource>
+  TCIMValueImpl* NewString(TSource&& source);
   template <class TKind, class TSource>
   TCIMValueImpl* NewData(TSource const& source);
-  TCIMValueImpl* NewCopyOf(TCIMValueImpl const& data);
-  bool IsInPlace() const noexcept;
+  TCIMNumericValueImpl const& NumberAs(TCIMType required) const;
+  TCIMValueImpl const& DataAs(TCIMType required) const;
+  [[noreturn]] void Refuse() const;
 
-  bool IsNumber() const noexcept { return fType >= TCIMType::kCIMTypeBoolean && fType <= TCIMType::kCIMTypeReal64; }
-  bool OwnsMemory() const noexcept { return fData != nullptr && !IsNumber(); }  // else it is destroyed without a call
+  void CopyOther(TCIMValue const& other);
+  bool EqualsOther(TCIMValue const& other) const;
+  bool IsLessThanOther(TCIMValue const& other) const;
   void DestroyData() noexcept;
   void TakeData(TCIMValue&& other) noexcept;
   void TakeFrom(TCIMValue&& other) noexcept;
-  TCIMValueImpl const& DataAs(TCIMType required) const;
 
   TCIMType fType;
   unsigned int fMaxArraySize = 0;
@@ -234,3 +245,5 @@ ZEP_EXPORT std::ostream& operator<<(std::ostream& stream, TCIMValue::TCIMType co
 using TCIMContext = std::map<std::string, TCIMValue>;
 
 }  // namespace NQRVZEP20
+
+#include "TCIMValueInline.h"

@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
-#pragma once
+#include "TCIMValue.h"  // leads to this header again, which is why the guard stands below it
 
-#include "TCIMValue.h"
+#ifndef ZEP_TCIM_VALUE_IMPL_H
+#define ZEP_TCIM_VALUE_IMPL_H
+
 #include "ZEPExport.h"
 
 #include <string>
@@ -66,3 +68,5 @@ private:
 };
 
 }  // namespace NQRVZEP20
+
+#endif

@@ -39,6 +39,7 @@
 #include "TCIMStringValueImpl.h"
 #include "TCIMValue.h"
 #include "TCIMValueImpl.h"
+#include "TCIMValueInline.h"
 #include "TCommUtil.h"
 #include "TConfig.h"
 #include "TLogger.h"

@@ -95,11 +95,11 @@ TCIMReferenceImpl::TCIMReferenceImpl(TCIMReference& owner, boost::shared_ptr<ICI
     : fOwner(owner), fNamespace(ns), fContext(std::move(context)) {}
 
 TCIMReferenceImpl::TCIMReferenceImpl(TCIMReference& owner, TCIMReferenceImpl const& other)
-    : fOwner(owner),
+    : fClass(other.fClass),
+      fKeys(other.fKeys),
+      fOwner(owner),
       fNamespace(other.fNamespace),
       fContext(other.fContext),
-      fClass(other.fClass),
-      fKeys(other.fKeys),
       fElement(other.fElement),
       fNamespaceName(other.fNamespaceName) {}
 

@@ -69,17 +69,29 @@ TReal ReadExtremeReal(std::string_view text) {
   return stream >> number ? number : 0;
 }
 
+// Reads a real of which std::from_chars accepts too much ("inf") or too little ("1e", which is not a number for a stream).
 template <class TReal>
-TReal ReadReal(std::string_view text) {
-  std::string_view digits = WithoutLeadingBlanks(text);
-  bool const negative = TakeSign(digits);
+TReal ReadUnusualReal(std::string_view text, std::string_view digits, bool negative) {
   digits = TakeReal(digits);
-
   TReal magnitude = 0;
   char const* const end = digits.data() + digits.size();
   auto const read = std::from_chars(digits.data(), end, magnitude);
   if (read.ec == std::errc::invalid_argument || read.ptr != end) return 0;
   if (read.ec == std::errc::result_out_of_range) return ReadExtremeReal<TReal>(text);
+  return negative ? -magnitude : magnitude;
+}
+
+template <class TReal>
+TReal ReadReal(std::string_view text) {
+  std::string_view digits = WithoutLeadingBlanks(text);
+  bool const negative = TakeSign(digits);
+  if (digits.empty() || !IsDigit(digits[0])) return ReadUnusualReal<TReal>(text, digits, negative);
+
+  TReal magnitude = 0;
+  char const* const end = digits.data() + digits.size();
+  auto const read = std::from_chars(digits.data(), end, magnitude);
+  bool const isWhole = read.ptr == end || (*read.ptr != 'e' && *read.ptr != 'E');
+  if (read.ec != std::errc() || !isWhole) return ReadUnusualReal<TReal>(text, digits, negative);
   return negative ? -magnitude : magnitude;
 }
 

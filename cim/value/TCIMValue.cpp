@@ -60,42 +60,31 @@ std::ostream& operator<<(std::ostream& stream, TCIMValue::TCIMType const& type) 
 
 // ---- The data ----
 
-namespace {
-
-// The kinds that are stored inside a value.
-template <class TKind>
-constexpr bool kIsInPlace = std::is_same_v<TKind, TCIMNumericValueImpl> || std::is_same_v<TKind, TCIMStringValueImpl>;
-
-}  // namespace
-
-// The data of a value that is NULL until now.
+// The data of a value that is NULL until now, of a kind that is allocated on the heap.
 template <class TKind, class TSource>
 TCIMValueImpl* TCIMValue::NewData(TSource const& source) {
-  static_assert(!kIsInPlace<TKind> || (sizeof(TKind) <= sizeof fPlace && alignof(TKind) <= alignof(void*)));
-  if constexpr (kIsInPlace<TKind>)
-    return new (fPlace) TKind(source);
+  return std::make_unique<TKind>(source).release();
+}
+
+// The rest of copying: values that are NULL, and those whose data are on the heap.
+void TCIMValue::CopyOther(TCIMValue const& other) {
+  if (IsArray()) fMaxArraySize = other.fMaxArraySize;
+  if (IsReference()) fReferencedClass = other.fReferencedClass;
+  if (other.IsNull()) return;
+  if (IsArray())
+    fData = NewData<TCIMArrayValueImpl>(static_cast<TCIMArrayValueImpl const&>(*other.fData));
   else
-    return std::make_unique<TKind>(source).release();
+    fData = OnScalarType(fType, [&](auto scalar) -> TCIMValueImpl* {
+      using TKind = typename decltype(scalar)::TKind;
+      return NewData<TKind>(static_cast<TKind const&>(*other.fData));
+    });
 }
 
-// `data`: of a value of this type.
-TCIMValueImpl* TCIMValue::NewCopyOf(TCIMValueImpl const& data) {
-  if (IsNumber()) return NewData<TCIMNumericValueImpl>(static_cast<TCIMNumericValueImpl const&>(data));
-  if (IsArray()) return NewData<TCIMArrayValueImpl>(static_cast<TCIMArrayValueImpl const&>(data));
-  return OnScalarType(fType, [&](auto scalar) {
-    using TKind = typename decltype(scalar)::TKind;
-    return NewData<TKind>(static_cast<TKind const&>(data));
-  });
-}
-
-bool TCIMValue::IsInPlace() const noexcept { return static_cast<void const*>(fData) == fPlace; }
-
-// A number needs no destruction.
 void TCIMValue::DestroyData() noexcept {
-  if (!IsInPlace())
+  if (HoldsString())
+    String().TCIMStringValueImpl::~TCIMStringValueImpl();
+  else if (!IsNumber())  // a number needs no destruction
     delete fData;
-  else if (fType == TType::kCIMTypeString)
-    static_cast<TCIMStringValueImpl*>(fData)->TCIMStringValueImpl::~TCIMStringValueImpl();
   fData = nullptr;
 }
 
@@ -103,37 +92,22 @@ void TCIMValue::DestroyData() noexcept {
 void TCIMValue::TakeData(TCIMValue&& other) noexcept {
   DestroyData();
   fType = other.fType;
-  if (!other.IsInPlace())
-    fData = std::exchange(other.fData, nullptr);
-  else if (fType == TType::kCIMTypeString)
-    fData = new (fPlace) TCIMStringValueImpl(std::move(static_cast<TCIMStringValueImpl&>(*other.fData)));
+  if (other.HoldsNumber())
+    fData = NewNumber(other.Number());
+  else if (other.HoldsString())
+    fData = NewString(std::move(static_cast<TCIMStringValueImpl&>(*other.fData)));
   else
-    fData = new (fPlace) TCIMNumericValueImpl(static_cast<TCIMNumericValueImpl&>(*other.fData));
+    fData = std::exchange(other.fData, nullptr);
   other.DestroyData();
   other.fType = TType::kCIMTypeInvalid;
 }
 
 // ---- Construction ----
 
-TCIMValue::TCIMValue() noexcept : fType(TType::kCIMTypeInvalid) {}
-
 TCIMValue::TCIMValue(TCIMType type, unsigned int arraySize)
     : fType(arraySize != 0 ? ArrayOf(type) : type), fMaxArraySize(arraySize) {}
 
-TCIMValue::TCIMValue(bool value) : fType(TType::kCIMTypeBoolean), fData(NewData<TCIMNumericValueImpl>(value)) {}
-TCIMValue::TCIMValue(unsigned char value) : fType(TType::kCIMTypeUint8), fData(NewData<TCIMNumericValueImpl>(value)) {}
-TCIMValue::TCIMValue(signed char value) : fType(TType::kCIMTypeSint8), fData(NewData<TCIMNumericValueImpl>(value)) {}
-TCIMValue::TCIMValue(unsigned short value) : fType(TType::kCIMTypeUint16), fData(NewData<TCIMNumericValueImpl>(value)) {}
-TCIMValue::TCIMValue(short value) : fType(TType::kCIMTypeSint16), fData(NewData<TCIMNumericValueImpl>(value)) {}
-TCIMValue::TCIMValue(unsigned int value) : fType(TType::kCIMTypeUint32), fData(NewData<TCIMNumericValueImpl>(value)) {}
-TCIMValue::TCIMValue(int value) : fType(TType::kCIMTypeSint32), fData(NewData<TCIMNumericValueImpl>(value)) {}
-TCIMValue::TCIMValue(unsigned long value) : fType(TType::kCIMTypeUint64), fData(NewData<TCIMNumericValueImpl>(value)) {}
-TCIMValue::TCIMValue(long value) : fType(TType::kCIMTypeSint64), fData(NewData<TCIMNumericValueImpl>(value)) {}
-TCIMValue::TCIMValue(float value) : fType(TType::kCIMTypeReal32), fData(NewData<TCIMNumericValueImpl>(value)) {}
-TCIMValue::TCIMValue(double value) : fType(TType::kCIMTypeReal64), fData(NewData<TCIMNumericValueImpl>(value)) {}
 TCIMValue::TCIMValue(TCIMChar16 const& value) : fType(TType::kCIMTypeChar16), fData(NewData<TCIMChar16ValueImpl>(value)) {}
-TCIMValue::TCIMValue(char const* value) : fType(TType::kCIMTypeString), fData(NewData<TCIMStringValueImpl>(value)) {}
-TCIMValue::TCIMValue(std::string const& value) : fType(TType::kCIMTypeString), fData(NewData<TCIMStringValueImpl>(value)) {}
 
 TCIMValue::TCIMValue(TCIMDateTime const& value) : fType(TType::kCIMTypeDateTime), fData(NewData<TCIMDateTimeValueImpl>(value)) {}
 
@@ -154,16 +128,11 @@ TCIMValue::TCIMValue(TCIMType type, std::string& text, boost::shared_ptr<ICIMNam
       using TRead = std::conditional_t<std::is_same_v<TStorage, unsigned char>, unsigned int,
                                        std::conditional_t<std::is_same_v<TStorage, signed char>, int, TStorage>>;
       fType = type;
-      fData = NewData<TCIMNumericValueImpl>(static_cast<TStorage>(ReadNumber<TRead>(text)));
+      fData = NewNumber(static_cast<TStorage>(ReadNumber<TRead>(text)));
     } else {
       Set(static_cast<TStorage const&>(text));
     }
   });
-}
-
-TCIMValue::TCIMValue(TCIMValue const& other) : fType(other.fType), fMaxArraySize(other.IsArray() ? other.fMaxArraySize : 0) {
-  if (IsReference()) fReferencedClass = other.fReferencedClass;
-  if (!other.IsNull()) fData = NewCopyOf(*other.fData);
 }
 
 TCIMValue::TCIMValue(TCIMValue&& other) noexcept : TCIMValue() { TakeFrom(std::move(other)); }
@@ -242,22 +211,12 @@ void TCIMValue::SetReferencedClass(boost::shared_ptr<ICIMClass> referencedClass)
 
 // The data, after the checks that every conversion makes.
 TCIMValueImpl const& TCIMValue::DataAs(TCIMType required) const {
-  if (IsNull()) throw TZEPException(kZEPStatusValueIsNULL);
-  if (fType != required) throw TZEPException(kZEPStatusTypeMismatch);
+  if (IsNull() || fType != required) Refuse();
   return *fData;
 }
 
-TCIMValue::operator bool() const { return DataAs(TType::kCIMTypeBoolean).operator bool(); }
-TCIMValue::operator unsigned char() const { return DataAs(TType::kCIMTypeUint8).operator unsigned char(); }
-TCIMValue::operator signed char() const { return DataAs(TType::kCIMTypeSint8).operator signed char(); }
-TCIMValue::operator unsigned short() const { return DataAs(TType::kCIMTypeUint16).operator unsigned short(); }
-TCIMValue::operator short() const { return DataAs(TType::kCIMTypeSint16).operator short(); }
-TCIMValue::operator unsigned int() const { return DataAs(TType::kCIMTypeUint32).operator unsigned int(); }
-TCIMValue::operator int() const { return DataAs(TType::kCIMTypeSint32).operator int(); }
-TCIMValue::operator unsigned long() const { return DataAs(TType::kCIMTypeUint64).operator unsigned long(); }
-TCIMValue::operator long() const { return DataAs(TType::kCIMTypeSint64).operator long(); }
-TCIMValue::operator float() const { return DataAs(TType::kCIMTypeReal32).operator float(); }
-TCIMValue::operator double() const { return DataAs(TType::kCIMTypeReal64).operator double(); }
+void TCIMValue::Refuse() const { throw TZEPException(IsNull() ? kZEPStatusValueIsNULL : kZEPStatusTypeMismatch); }
+
 TCIMValue::operator std::string() const { return DataAs(TType::kCIMTypeString).operator std::string(); }
 TCIMValue::operator TCIMDateTime() const { return DataAs(TType::kCIMTypeDateTime).operator TCIMDateTime(); }
 TCIMValue::operator TCIMReference() const { return DataAs(TType::kCIMTypeReference).operator TCIMReference(); }
@@ -273,15 +232,16 @@ std::string TCIMValue::ToString(unsigned char radix) const {
 
 // ---- Comparisons ----
 
-bool TCIMValue::operator==(TCIMValue const& other) const {
-  if (IsNull() != other.IsNull() || fType != other.fType) return false;
+// The rest of ==: two values with the same tag, both NULL or both with data on the heap.
+bool TCIMValue::EqualsOther(TCIMValue const& other) const {
   if (!IsNull()) return *fData == other;
   if (IsReference()) return fReferencedClass == other.fReferencedClass;
   if (IsArray()) return fMaxArraySize == other.fMaxArraySize;
   return true;
 }
 
-bool TCIMValue::operator<(TCIMValue const& other) const {
+// The rest of <: any values but two strings.
+bool TCIMValue::IsLessThanOther(TCIMValue const& other) const {
   if (IsNull() || other.IsNull()) return IsNull() && !other.IsNull();
   if (fType == other.fType) return *fData < other;
   return fType < other.fType;
