@@ -9,6 +9,7 @@ namespace {
 
 constexpr char const* kTableVariable = "ZEP_SMBIOS_TABLE";
 constexpr char const* kNameVariable = "ZEP_HOST_NAME";
+constexpr char const* kSampleVariable = "ZEP_SAMPLE";
 constexpr char const* kFromFile = " (file)";  // how the host provider marks values that it reads from a table file
 
 }  // namespace
@@ -16,6 +17,7 @@ constexpr char const* kFromFile = " (file)";  // how the host provider marks val
 void SetForProviders(TSample const& sample) {
   ::setenv(kTableVariable, sample.fTableFile.c_str(), 1);
   ::setenv(kNameVariable, sample.fHostName.c_str(), 1);
+  ::setenv(kSampleVariable, sample.fLabel.c_str(), 1);
 }
 
 std::string NamedTableFile() {

@@ -16,9 +16,9 @@ struct TSample {
   std::string fLabel;      // such as "SAMPLE"; not empty
 };
 
-// Makes providers read the sample, by setting the environment variables ZEP_SMBIOS_TABLE and ZEP_HOST_NAME of this process. The
-// variables stay set, because a provider may read them at any later time. LoadPlugIns calls this function. Not thread-safe: no
-// other thread may read or change the environment during the call.
+// Makes providers read the sample, by setting the environment variables ZEP_SMBIOS_TABLE, ZEP_HOST_NAME and ZEP_SAMPLE of this
+// process. The variables stay set, because a provider may read them at any later time. LoadPlugIns calls this function. Not
+// thread-safe: no other thread may read or change the environment during the call.
 void SetForProviders(TSample const& sample);
 
 // The value of ZEP_SMBIOS_TABLE: the table file to read instead of this machine's tables; empty if it is not set. After

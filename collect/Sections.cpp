@@ -184,15 +184,12 @@ std::string RecordedReason(TNamespaceView const& view, ICIMClass const& cls) {
   return reason;
 }
 
-// Why the section has no row of this provider; empty if nothing says so. The reasons of a namespace are about this machine.
-std::string WhyNoRow(TNamespaceView const& view, ICIMClass const& cls) {
-  return view.GetSampleLabel().empty() ? RecordedReason(view, cls) : "the sample does not describe them";
-}
-
 TReportSection SectionOf(TSubject const& subject, std::vector<TNamespaceView> const& views) {
   TReportSection section{subject.fKey, subject.fTitle, {}, {}, ""};
   for (TColumn const& column : subject.fColumns) section.fColumns.emplace_back(column.fTitle);
-  std::string whyEmpty;  // the reason of the first provider that has one
+  bool const isSample = !views.empty() && !views.front().GetSampleLabel().empty();
+  // The reason of the first provider that has one. For a sample none counts, since they are about this machine.
+  std::string whyEmpty = isSample ? "the sample does not describe them" : "";
   for (TNamespaceView const& view : views) {
     std::string const failure = FailureOf([&] {
       auto const cls = view.FindClass(subject.fClass);
@@ -201,7 +198,7 @@ TReportSection SectionOf(TSubject const& subject, std::vector<TNamespaceView> co
         auto const row = RowOf(view, *instance, subject);
         if (!IsEmptyRow(row) && view.IsOfReport(*instance)) section.fRows.push_back(row);
       }
-      if (whyEmpty.empty()) whyEmpty = WhyNoRow(view, *cls);
+      if (whyEmpty.empty()) whyEmpty = RecordedReason(view, *cls);
     });
     if (!failure.empty()) whyEmpty = "provider " + view.GetProviderName() + " failed: " + failure;
   }

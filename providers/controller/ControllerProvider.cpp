@@ -38,6 +38,7 @@ void NoteProgress(char const* step, std::size_t done, std::size_t all) {
 }
 
 void Fill(TMemoryNamespace& ns) {
+  if (IsSampleDescribed()) return;
   FillControllerNamespace(ReadController(Connection(), MakeCache, NoteProgress), TMachineFiles::OfThisProcess(), ns);
 }
 

@@ -14,7 +14,9 @@ namespace NQRVZEP20 {
 
 namespace {
 
-void Fill(TMemoryNamespace& ns) { FillDevicesNamespace(TMachineFiles::OfThisProcess(), ns); }
+void Fill(TMemoryNamespace& ns) {
+  if (!IsSampleDescribed()) FillDevicesNamespace(TMachineFiles::OfThisProcess(), ns);
+}
 
 struct TRegistration {
   TRegistration() {

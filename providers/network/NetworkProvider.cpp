@@ -15,7 +15,9 @@ namespace {
 
 struct TRegistration {
   TRegistration() {
-    auto const fill = [](TMemoryNamespace& ns) { FillNetworkNamespace(ns, TMachineFiles::OfThisProcess()); };
+    auto const fill = [](TMemoryNamespace& ns) {
+      if (!IsSampleDescribed()) FillNetworkNamespace(ns, TMachineFiles::OfThisProcess());
+    };
     TNamespaceProviderManager::GetInstance()->RegisterNamespaceProvider(
         boost::make_shared<TMemoryProvider>("Network", "root/zep/network", fill));
   }

@@ -180,4 +180,6 @@ TFinding<std::string> TMachineFiles::Answer(std::string const& name, std::functi
   return answer;
 }
 
+bool IsSampleDescribed() { return std::getenv("ZEP_SAMPLE") != nullptr; }
+
 }  // namespace NQRVZEP20

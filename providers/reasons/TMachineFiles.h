@@ -86,4 +86,9 @@ private:
   std::string fRoot;  // without a slash at the end; empty for "/"
 };
 
+// Whether a front end describes a sample instead of this machine, which the environment variable ZEP_SAMPLE says. A sample
+// consists of SMBIOS tables. A provider that reads none leaves its namespace empty then, since its facts would be those of this
+// machine.
+bool IsSampleDescribed();
+
 }  // namespace NQRVZEP20

@@ -14,7 +14,9 @@ namespace NQRVZEP20 {
 
 namespace {
 
-void Fill(TMemoryNamespace& ns) { FillSensorsNamespace(TMachineFiles::OfThisProcess(), ns); }
+void Fill(TMemoryNamespace& ns) {
+  if (!IsSampleDescribed()) FillSensorsNamespace(TMachineFiles::OfThisProcess(), ns);
+}
 
 struct TRegistration {
   TRegistration() {

@@ -14,7 +14,9 @@ namespace NQRVZEP20 {
 
 namespace {
 
-void Fill(TMemoryNamespace& ns) { FillStorageNamespace(ns, TMachineFiles::OfThisProcess()); }
+void Fill(TMemoryNamespace& ns) {
+  if (!IsSampleDescribed()) FillStorageNamespace(ns, TMachineFiles::OfThisProcess());
+}
 
 struct TRegistration {
   TRegistration() {

@@ -11,11 +11,12 @@ namespace NQRVZEP20 {
 namespace {
 
 TEST(SampleTest, ProvidersFindTheSampleInTheEnvironment) {
-  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", "/callers/table"), name("ZEP_HOST_NAME", "db1");
+  TEnvironmentGuard const table("ZEP_SMBIOS_TABLE", "/callers/table"), name("ZEP_HOST_NAME", "db1"), label("ZEP_SAMPLE", nullptr);
   EXPECT_EQ(NamedTableFile(), "/callers/table");
   SetForProviders({"/samples/table", "sample-server", "SAMPLE"});
   EXPECT_EQ(NamedTableFile(), "/samples/table");
   EXPECT_STREQ(std::getenv("ZEP_HOST_NAME"), "sample-server");
+  EXPECT_STREQ(std::getenv("ZEP_SAMPLE"), "SAMPLE");
 }
 
 TEST(SampleTest, SourcesAreLabelledOnlyWithASample) {

@@ -467,6 +467,18 @@ TEST_F(ReportTest, ClassesOfOtherPlugInsAreCounted) {
   EXPECT_THAT(run.fOutput, testing::ContainsRegex("\n[A-Za-z_]+ +[0-9]+ +root/test"));
 }
 
+TEST_F(ReportTest, ProvidersOfThisMachineAreEmptyForTheSample) {
+  fZep.Add("libSensors.nsp.so", TEST_LIB_DIR "/libSensors.nsp.so");
+  auto const classesOfSensors = [this](std::vector<std::string> const& arguments) {
+    auto const document = JsonOf(fZep.Run({arguments}));
+    for (auto const& ns : document["namespaces"])
+      if (ns["namespace"] == "root/zep/sensors") return ns["classes"].size();
+    return std::size_t(0);
+  };
+  EXPECT_GT(classesOfSensors({"classes", "--json"}), 0u);
+  EXPECT_EQ(classesOfSensors({"classes", "--json", "--sample"}), 0u);
+}
+
 // An association has no values of its own that could be those of the sample.
 bool IsAssociation(nlohmann::json const& instance) {
   auto const& properties = instance["properties"];
