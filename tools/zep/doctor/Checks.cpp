@@ -57,7 +57,8 @@ TCheck CheckSmbios(TSmbiosOutcome const& outcome) {
   std::string const tables = isNamed ? outcome.fNamedFile : "the kernel's tables";
   std::string const otherFile =
       isNamed ? "name another file in ZEP_SMBIOS_TABLE" : "name a dump of the tables in ZEP_SMBIOS_TABLE";
-  if (!outcome.fLibrary) return Fails(kName, "libsmbios.so " + ReasonOf(outcome.fLibrary), "install the package libzepcore1 anew");
+  if (!outcome.fLibrary)
+    return Fails(kName, "libsmbios.so " + ReasonOf(outcome.fLibrary), "install the package libzepcore1 anew");
   switch (outcome.fStatus) {
     case kSmbiosOk:
       return Works(kName, tables + (isNamed ? ", which ZEP_SMBIOS_TABLE names," : "") + " can be read");
@@ -154,8 +155,8 @@ std::vector<TCheck> CheckPlugIns(std::vector<TPlugIn> const& plugIns, std::strin
     checks.push_back(failures.empty() ? Works(name, plugIn.fFile) : Fails(name, Joined(failures, "; "), RemedyFor(plugIn)));
   }
   if (checks.empty())
-    checks.push_back(
-        Fails("plug-ins", "there is no plug-in in " + directory, "install the package zep-provider-host, or copy plug-ins there"));
+    checks.push_back(Fails("plug-ins", "there is no plug-in in " + directory,
+                           "install the package zep-provider-host, or copy plug-ins there"));
   return checks;
 }
 
