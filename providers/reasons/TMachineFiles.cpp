@@ -52,7 +52,12 @@ TFd OpenBelow(std::string const& root, std::string const& path, int flags) {
   open_how how = {};
   how.flags = static_cast<unsigned>(flags);
   how.resolve = RESOLVE_IN_ROOT;
-  return TFd(static_cast<int>(::syscall(SYS_openat2, directory.Get(), path.c_str(), &how, sizeof how)));
+  // The kernel gives up at ".." with EAGAIN if anything on the machine was renamed or mounted meanwhile.
+  constexpr int attempts = 10000;
+  for (int attempt = 1;; ++attempt) {
+    int const fd = static_cast<int>(::syscall(SYS_openat2, directory.Get(), path.c_str(), &how, sizeof how));
+    if (fd >= 0 || errno != EAGAIN || attempt == attempts) return TFd(fd);
+  }
 }
 
 TMissing WhyUnreadable(std::string const& path, int error) {

@@ -7,6 +7,10 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <atomic>
+#include <cstdio>
+#include <thread>
+
 namespace NQRVZEP20 {
 namespace {
 
@@ -102,6 +106,27 @@ TEST_F(TMachineFilesTest, LinksAreFollowedWithinTheRoot) {
   EXPECT_EQ(Shown(fFiles.Line("/absolute/eth0/address")), "52:54:00:12:34:56");
   EXPECT_EQ(Shown(fFiles.RealPath("/absolute/eth0")), "/sys/devices/pci0/net/eth0");
   EXPECT_EQ(Shown(fFiles.RealName("/absolute/eth0")), "eth0");
+}
+
+// The kernel cannot follow ".." while a file is renamed anywhere on the machine, and has to be asked again.
+TEST_F(TMachineFilesTest, LinksAreFollowedWhileFilesAreRenamed) {
+  Write("/sys/devices/pci0/net/eth0/mtu", "1500\n");
+  Link("../../devices/pci0/net/eth0", "/sys/class/net/eth0");
+  TTempDir const other;
+  WriteFile(other.Path("a"), "");
+  std::atomic<bool> isDone{false};
+  std::thread renames([&] {
+    while (!isDone) {
+      std::rename(other.Path("a").c_str(), other.Path("b").c_str());
+      std::rename(other.Path("b").c_str(), other.Path("a").c_str());
+    }
+  });
+  int found = 0;
+  constexpr int reads = 20000;
+  for (int left = reads; left > 0; --left) found += fFiles.Number<unsigned>("/sys/class/net/eth0/mtu") ? 1 : 0;
+  isDone = true;
+  renames.join();
+  EXPECT_EQ(found, reads);
 }
 
 TEST_F(TMachineFilesTest, NoLinkLeadsOutOfTheRoot) {
