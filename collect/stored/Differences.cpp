@@ -105,15 +105,12 @@ std::set<std::string> ProvidersIn(TStoredReport const& report) {
 // The providers whose objects `other` cannot have, because they failed there or do not exist, and why.
 std::map<std::string, std::string> Incomparable(TStoredReport const& report, TStoredReport const& other) {
   std::map<std::string, std::string> reasons;
-  auto const failures = FailuresIn(other);
+  for (auto const& [name, failure] : FailuresIn(other))
+    reasons[name] = "provider " + name + " failed in " + other.fFile + ": " + failure;
   for (std::string const& name : ProvidersIn(report)) {
-    auto const failure = failures.find(name);
     bool const exists = std::any_of(other.fProviders.begin(), other.fProviders.end(),
                                     [&](TStoredProvider const& provider) { return provider.fName == name; });
-    if (failure != failures.end())
-      reasons[name] = "provider " + name + " failed in " + other.fFile + ": " + failure->second;
-    else if (!exists)
-      reasons[name] = "provider " + name + " does not exist in " + other.fFile;
+    if (!exists) reasons.emplace(name, "provider " + name + " does not exist in " + other.fFile);
   }
   return reasons;
 }
@@ -150,13 +147,18 @@ std::vector<TObjectDifference> ObjectsOf(TInstances const& before, TInstances co
 
 // ---- Rows and problems ----
 
+// A reason may contain a figure that changes, so two missing values are the same.
+bool IsSame(TAnswer<std::string> const& before, TAnswer<std::string> const& after) {
+  return before.IsKnown() == after.IsKnown() && (!before.IsKnown() || *before.fValue == *after.fValue);
+}
+
 void AddRows(std::vector<TStoredRow> const& before, std::vector<TStoredRow> const& after, std::vector<TChange>& changes) {
   auto const text = [](TStoredRow const& row) {
     return row.fAnswer.IsKnown() ? *row.fAnswer.fValue : "unknown (" + row.fAnswer.fMissing.fReason + ")";
   };
   for (TStoredRow const& row : before)
     for (TStoredRow const& other : after)
-      if (row.fKey == other.fKey && text(row) != text(other)) changes.push_back({row.fLabel, text(row), text(other)});
+      if (row.fKey == other.fKey && !IsSame(row.fAnswer, other.fAnswer)) changes.push_back({row.fLabel, text(row), text(other)});
 }
 
 // The problems of `some` that `others` lacks. The reason may contain a figure that changes, so it does not count.

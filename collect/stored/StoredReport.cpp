@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
+#include <initializer_list>
 #include <string_view>
 
 namespace NQRVZEP20 {
@@ -41,7 +42,8 @@ private:
 
 // "line 3, column 9: syntax error while parsing value - unexpected end of input": the message without the number of the exception
 // and without the text of the file, which may be a password.
-std::string WhyNotJson(TJson::parse_error const& failure) {
+std::string WhyNotJson(TJson::exception const& failure) {
+  if (dynamic_cast<TJson::parse_error const*>(&failure) == nullptr) return "a number is too large";
   std::string_view what = failure.what();
   if (std::size_t const at = what.find("line "); at != what.npos) what.remove_prefix(at);
   return Printable(what.substr(0, what.find("; last read")));
@@ -53,7 +55,7 @@ TJson Parsed(std::string const& text) {
   TBounds bounds;
   try {
     return TJson::parse(text, [&](int depth, TJson::parse_event_t event, TJson&) { return bounds.Check(depth, event); });
-  } catch (TJson::parse_error const& failure) {
+  } catch (TJson::exception const& failure) {
     throw TStoredReportError(WhyNotJson(failure));
   }
 }
@@ -105,13 +107,20 @@ TReportSection SectionOf(TStoredNode const& node) {
   return section;
 }
 
+// The text of the member, which must be one of the words.
+std::string WordOf(TStoredNode const& node, char const* name, std::initializer_list<std::string_view> words) {
+  std::string const text = node.TextOf(name);
+  if (std::find(words.begin(), words.end(), text) == words.end()) node.Member(name).Refuse("is a word that no report has");
+  return text;
+}
+
 TStoredProblem ProblemOf(TStoredNode const& node) {
-  return {node.TextOf("rule"), node.TextOf("severity"), node.TextOf("reason"), node.TextOrNullOf("remedy"),
-          node.TextOrNullOf("instance")};
+  return {node.TextOf("rule"), WordOf(node, "severity", {"critical", "error", "warning", "information"}), node.TextOf("reason"),
+          node.TextOrNullOf("remedy"), node.TextOrNullOf("instance")};
 }
 
 TStoredRule RuleOf(TStoredNode const& node) {
-  return {node.TextOf("id"), node.TextOf("question"), node.TextOf("outcome"),
+  return {node.TextOf("id"), node.TextOf("question"), WordOf(node, "outcome", {"fine", "wrong", "not-asked"}),
           node.Member("notExamined").Elements([](TStoredNode const& element) { return element.TextOf("reason"); })};
 }
 
@@ -175,6 +184,13 @@ TStoredInstance InstanceOf(TStoredNode const& node) {
   return instance;
 }
 
+// A provider that filled its namespace may still have failed when its instances were read: the document has only some of them.
+void AddFailureOfInstances(TStoredNode const& failure, std::vector<TStoredProvider>& providers) {
+  std::string const name = failure.TextOf("provider"), error = failure.TextOf("error");
+  for (TStoredProvider& provider : providers)
+    if (provider.fName == name) provider.fError = error;
+}
+
 TStoredReport ReportOf(TStoredNode const& document) {
   CheckHead(document);
   TStoredReport report;
@@ -192,6 +208,8 @@ TStoredReport ReportOf(TStoredNode const& document) {
   if (auto const sections = document.Optional("sections")) report.fSections = sections->Elements(SectionOf);
   document.Member("plugIns").ForEachElement([&](TStoredNode const& plugIn) { AddProviders(plugIn, report.fProviders); });
   report.fInstances = document.Member("instances").Elements(InstanceOf);
+  if (auto const failures = document.Optional("instanceFailures"))
+    failures->ForEachElement([&](TStoredNode const& failure) { AddFailureOfInstances(failure, report.fProviders); });
   return report;
 }
 

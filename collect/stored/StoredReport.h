@@ -60,7 +60,7 @@ struct TStoredRule {
 struct TStoredProvider {
   std::string fPlugIn, fName, fNamespace;
   double fMilliseconds;
-  std::string fError;  // empty if it filled its namespace
+  std::string fError;  // empty if it filled its namespace, and all its instances could be read
 };
 
 // A document of `zep report --json` that was read back. A plain value.

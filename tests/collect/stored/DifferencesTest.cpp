@@ -7,10 +7,10 @@
 namespace NQRVZEP20 {
 namespace {
 
-TStoredReport Before() { return StoredReportFrom(StoredDocument(), "a.json"); }
+TStoredReport Before() { return StoredReportFrom(HealthyDocument(), "a.json"); }
 
 TStoredReport With(std::string const& from, std::string const& to) {
-  return StoredReportFrom(StoredDocumentWith(from, to), "b.json");
+  return StoredReportFrom(HealthyDocumentWith(from, to), "b.json");
 }
 
 // A report whose first instance is a sensor of that class with one reading.
@@ -70,6 +70,7 @@ TEST(DifferencesTest, RowsAndProblemsAreCompared) {
   EXPECT_EQ(DifferencesOf(healthy, Before()).fNewProblems.at(0).fRule, "disk-failing");
   EXPECT_EQ(DifferencesOf(Before(), healthy).fSolvedProblems.at(0).fRule, "disk-failing");
   EXPECT_TRUE(DifferencesOf(Before(), With("sda is failing", "sda is failing for 7 hours")).IsSame());
+  EXPECT_TRUE(DifferencesOf(Before(), With("\"reason\": \"needs root\"", "\"reason\": \"took 5 s\"")).IsSame());
 }
 
 TEST(DifferencesTest, WithinWhatAlwaysChangesReportsAreTheSame) {
@@ -111,6 +112,11 @@ TEST(DifferencesTest, ObjectsOfAProviderThatFailedAreNotCompared) {
   }
   failed.fProviders.clear();
   EXPECT_EQ(DifferencesOf(Before(), failed).fNotCompared.at(0), "provider Host does not exist in b.json");
+}
+
+TEST(DifferencesTest, APlugInThatFailedInBothReportsIsNamed) {
+  TStoredReport const report = StoredReportFrom(StoredDocument(), "a.json");
+  EXPECT_EQ(DifferencesOf(report, report).fNotCompared, (std::vector<std::string>{"provider Disks failed in a.json: no disk"}));
 }
 
 }  // namespace

@@ -47,11 +47,20 @@ inline std::string StoredDocument() {
 })";
 }
 
-// The document with every occurrence of `from` replaced.
-inline std::string StoredDocumentWith(std::string const& from, std::string const& to) {
-  std::string text = StoredDocument();
+inline std::string WithReplaced(std::string text, std::string const& from, std::string const& to) {
   for (std::size_t at = 0; (at = text.find(from, at)) != text.npos; at += to.size()) text.replace(at, from.size(), to);
   return text;
+}
+
+// The document with every occurrence of `from` replaced.
+inline std::string StoredDocumentWith(std::string const& from, std::string const& to) {
+  return WithReplaced(StoredDocument(), from, to);
+}
+
+// The same of a run in which no plug-in failed.
+inline std::string HealthyDocument() { return StoredDocumentWith("\"no disk\", \"stage\": \"open\"", "null, \"stage\": null"); }
+inline std::string HealthyDocumentWith(std::string const& from, std::string const& to) {
+  return WithReplaced(HealthyDocument(), from, to);
 }
 
 }  // namespace NQRVZEP20

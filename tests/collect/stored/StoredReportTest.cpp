@@ -44,7 +44,16 @@ TEST(StoredReportTest, HasTheTablesAndTheProviders) {
   EXPECT_EQ(report.fSections.at(0).fRows.at(1).at(1).fMissing.fCode, "not-given");
   ASSERT_EQ(report.fProviders.size(), 2u);
   EXPECT_EQ(report.fProviders[0].fMilliseconds, 2);
+  EXPECT_EQ(report.fProviders[0].fError, "");
   EXPECT_EQ(report.fProviders[1].fError, "no disk");
+}
+
+TEST(StoredReportTest, AProviderWhoseInstancesCouldNotBeReadHasFailed) {
+  TStoredReport const report = StoredReportFrom(
+      StoredDocumentWith("\"instances\": [",
+                         "\"instanceFailures\": [{\"provider\": \"Host\", \"error\": \"no more\"}],\n\"instances\": ["),
+      "a.json");
+  EXPECT_EQ(report.fProviders[0].fError, "no more");
 }
 
 TEST(StoredReportTest, ValuesHaveWordsAndUnits) {
@@ -91,6 +100,9 @@ TEST(StoredReportTest, AnAlteredDocumentIsRefusedWithThePlace) {
       {"\"status\"", "\"x\"", "a.json: it has no report: "},
       {"\"head\": [\"db1", "\"head\": [1, \"db1", "a.json: /head/0: is not a string"},
       {"\"outcome\"", "\"x\"", "a.json: /findings/rules/0: has no member \"outcome\""},
+      {"\"wrong\"", "\"so\"", "a.json: /findings/rules/0/outcome: is a word that no report has"},
+      {"\"severity\": \"error\"", "\"severity\": \"fatal\"",
+       "a.json: /findings/problems/0/severity: is a word that no report has"},
       {"\"DIMM 2\", {", "{", "a.json: /sections/0/rows/1: has not as many cells as the table has columns"},
       {"\"value\": \"17179869184\"", "\"value\": {}", "a.json: /instances/0/properties/Capacity/value: is not a value"},
       {"\"value\": [2, 9]", "\"value\": [2, []]", "a.json: /instances/0/properties/States/value/1: is not a value"},
@@ -111,6 +123,7 @@ TEST(StoredReportTest, ForeignBytesAreRefused) {
   EXPECT_EQ(WhyTextRefused("\"secret\n"),
             "a.json: line 2, column 0: syntax error while parsing value - invalid string: control character U+000A (LF) must be "
             "escaped to \\u000A or \\n");
+  EXPECT_EQ(WhyTextRefused("{\"x\":1e999}"), "a.json: a number is too large");
   EXPECT_EQ(WhyTextRefused("[]"), "a.json: the document is not an object");
   EXPECT_EQ(WhyTextRefused("{}"), "a.json: it is not a document of zep report --json");
   EXPECT_EQ(WhyTextRefused("\x7f"

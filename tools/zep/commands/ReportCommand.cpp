@@ -187,7 +187,8 @@ void AddStoredOptions(CLI::App& command, TArguments& arguments) {
     since->excludes(command.get_option(other));
   }
   for (char const* other : {"--json", "--sample", "--plugin"}) from->excludes(command.get_option(other));
-  command.get_option("--html")->excludes(command.get_option("--to-media"));
+  for (char const* other : {"--to-media", "--section", "--full"})
+    command.get_option("--html")->excludes(command.get_option(other));
 }
 
 }  // namespace

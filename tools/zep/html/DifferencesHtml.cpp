@@ -38,7 +38,8 @@ std::string List(std::string const& title, std::string const& items) {
 std::string DifferencesAsHtml(TDifferences const& differences, TStoredReport const& before, TStoredReport const& after) {
   std::string problems, objects, notCompared;
   for (TStoredProblem const& problem : differences.fNewProblems)
-    problems += Item(problem.fSeverity, "new " + problem.fSeverity, problem.fReason, Element("p", problem.fRemedy));
+    problems += Item(problem.fSeverity, "new " + problem.fSeverity, problem.fReason,
+                     problem.fRemedy.empty() ? "" : Element("p", problem.fRemedy));
   for (TStoredProblem const& problem : differences.fSolvedProblems) problems += Item("fine", "solved", problem.fReason, "");
   for (TObjectDifference const& object : differences.fObjects) objects += Object(object);
   for (std::string const& reason : differences.fNotCompared) notCompared += Item("warning", "not compared", reason, "");

@@ -76,8 +76,8 @@ std::string CountsOf(TDifferences const& differences) {
                                      [&](TObjectDifference const& object) { return object.fKind == kind; });
     add(static_cast<std::size_t>(count) + (kind == EKind::kChanged ? differences.fRows.size() : 0), NameOf(kind));
   }
-  add(differences.fNewProblems.size(), "new problems");
-  add(differences.fSolvedProblems.size(), "solved problems");
+  add(differences.fNewProblems.size(), differences.fNewProblems.size() == 1 ? "new problem" : "new problems");
+  add(differences.fSolvedProblems.size(), differences.fSolvedProblems.size() == 1 ? "solved problem" : "solved problems");
   return Joined(counts, ", ");
 }
 

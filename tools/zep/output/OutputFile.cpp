@@ -21,31 +21,31 @@ namespace {
   throw TFailure(kExitNotWritten, file + " cannot be written: " + why);
 }
 
-void CheckTarget(std::string const& file) {
+// The mode of the file that is replaced or, for a new one, that which the shell would give it.
+mode_t ModeFor(std::string const& file) {
   struct stat target {};
-  if (::lstat(file.c_str(), &target) == 0 && !S_ISREG(target.st_mode)) Throw(file, "it is not a regular file");
-}
-
-// The mode of a new file, as the shell would make it.
-mode_t UsualMode() {
+  if (::lstat(file.c_str(), &target) == 0) {
+    if (!S_ISREG(target.st_mode)) Throw(file, "it is not a regular file");
+    return target.st_mode & 0777;
+  }
   mode_t const mask = ::umask(0);
   ::umask(mask);
   return 0666 & ~mask;
 }
 
-bool WriteAndRename(int draft, std::string const& name, std::string const& file, std::string const& text) {
-  return WriteWhole(draft, text) && ::fchmod(draft, UsualMode()) == 0 && ::fsync(draft) == 0 &&
+bool WriteAndRename(int draft, mode_t mode, std::string const& name, std::string const& file, std::string const& text) {
+  return WriteWhole(draft, text) && ::fchmod(draft, mode) == 0 && ::fsync(draft) == 0 &&
          std::rename(name.c_str(), file.c_str()) == 0;
 }
 
 }  // namespace
 
 void WriteOutputFile(std::string const& file, std::string const& text) {
-  CheckTarget(file);
+  mode_t const mode = ModeFor(file);
   std::string name = file + ".XXXXXX";
   TUniqueFd const draft(::mkstemp(name.data()));
   if (!draft) Throw(file, std::strerror(errno));
-  if (WriteAndRename(draft.get(), name, file, text)) return;
+  if (WriteAndRename(draft.get(), mode, name, file, text)) return;
   int const error = errno;
   ::unlink(name.c_str());
   Throw(file, std::strerror(error));

@@ -4,16 +4,22 @@
 #include "tools/zep/output/SectionText.h"
 #include "tools/zep/output/Text.h"
 
+#include <algorithm>
+
 namespace NQRVZEP20::zep {
 
 namespace {
 
 std::string ProblemsAsText(TStoredReport const& report) {
-  if (report.fProblems.empty()) return "Findings: no problem was found\n";
+  bool const isAllAsked = std::none_of(report.fRules.begin(), report.fRules.end(),
+                                       [](TStoredRule const& rule) { return rule.fOutcome == "not-asked"; });
+  if (report.fProblems.empty())
+    return std::string("Findings: no problem was found") + (isAllAsked ? "" : " by the rules that could be asked") + "\n";
   TTable table({12, 66});
   table.Add({"Findings", "Problem"});
   for (TStoredProblem const& problem : report.fProblems)
-    table.Add({problem.fSeverity, problem.fReason + ". " + problem.fRemedy + " (" + problem.fRule + ")"});
+    table.Add({problem.fSeverity,
+               problem.fReason + ". " + problem.fRemedy + (problem.fRemedy.empty() ? "(" : " (") + problem.fRule + ")"});
   return table.GetText();
 }
 

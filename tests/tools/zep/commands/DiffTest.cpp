@@ -15,7 +15,7 @@ using testing::HasSubstr;
 class DiffTest : public testing::Test {
 protected:
   DiffTest() {
-    Write("a.json", StoredDocument());
+    Write("a.json", HealthyDocument());
     Write("cut.json", StoredDocument().substr(0, 900));
     TRun const run = fZep.Run({{"report", "--sample", "--json"}});
     Write("sample.json", run.fOutput);
@@ -85,7 +85,7 @@ TEST_F(DiffTest, ThePageOfThisMachineIsThatOfItsDocument) {
 }
 
 TEST_F(DiffTest, TheDifferencesCanBeAPage) {
-  Write("b.json", StoredDocumentWith("17179869184", "34359738368"));
+  Write("b.json", HealthyDocumentWith("17179869184", "34359738368"));
   TRun const run = Run({"diff", "a.json", "b.json", "--html", "page"});
   EXPECT_EQ(run.fStatus, 1);
   EXPECT_EQ(run.fOutput, "");

@@ -30,8 +30,8 @@ protected:
     Write("bad.mof", "class\n");
     Write("there", "");
     Write("hosts", "one\ntwo\n");
-    Write("a.json", StoredDocument());
-    Write("b.json", StoredDocumentWith("db1", "db2"));
+    Write("a.json", HealthyDocument());
+    Write("b.json", HealthyDocumentWith("db1", "db2"));
   }
 
   void Write(std::string const& name, std::string const& text) { WriteFile(fZep.Path("work/" + name), text); }

@@ -12,8 +12,8 @@ namespace {
 using testing::HasSubstr;
 
 TEST(DifferencesHtmlTest, HasTheObjectsWithTheirChanges) {
-  TStoredReport const before = StoredReportFrom(StoredDocument(), "a.json"),
-                      after = StoredReportFrom(StoredDocumentWith("17179869184", "34359738368"), "b.json");
+  TStoredReport const before = StoredReportFrom(HealthyDocument(), "a.json"),
+                      after = StoredReportFrom(HealthyDocumentWith("17179869184", "34359738368"), "b.json");
   std::string const page = DifferencesAsHtml(DifferencesOf(before, after), before, after);
   EXPECT_THAT(page, HasSubstr(">1 changed<"));
   EXPECT_THAT(page, HasSubstr("<dt>Capacity</dt><dd><del>16 GiB</del> \xe2\x86\x92 <ins>32 GiB</ins></dd>"));
@@ -21,8 +21,8 @@ TEST(DifferencesHtmlTest, HasTheObjectsWithTheirChanges) {
 }
 
 TEST(DifferencesHtmlTest, MarkupIsShownAsText) {
-  TStoredReport const before = StoredReportFrom(StoredDocument(), "a.json"),
-                      after = StoredReportFrom(StoredDocumentWith("DIMM 2", "<b>"), "b.json");
+  TStoredReport const before = StoredReportFrom(HealthyDocument(), "a.json"),
+                      after = StoredReportFrom(HealthyDocumentWith("DIMM 2", "<b>"), "b.json");
   EXPECT_THAT(DifferencesAsHtml(DifferencesOf(before, after), before, after), HasSubstr("<ins>&lt;b&gt;</ins>"));
 }
 

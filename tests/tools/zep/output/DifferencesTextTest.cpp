@@ -8,10 +8,10 @@
 namespace NQRVZEP20::zep {
 namespace {
 
-TStoredReport Before() { return StoredReportFrom(StoredDocument(), "a.json"); }
+TStoredReport Before() { return StoredReportFrom(HealthyDocument(), "a.json"); }
 
 TStoredReport With(std::string const& from, std::string const& to) {
-  return StoredReportFrom(StoredDocumentWith(from, to), "b.json");
+  return StoredReportFrom(HealthyDocumentWith(from, to), "b.json");
 }
 
 std::string TextOf(TStoredReport const& after) { return DifferencesAsText(DifferencesOf(Before(), after)); }

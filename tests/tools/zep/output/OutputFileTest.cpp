@@ -26,24 +26,27 @@ std::string WhyRefused(std::string const& file) {
   return "";
 }
 
-TEST(OutputFileTest, WritesAndReplacesAFileWithTheUsualMode) {
+TEST(OutputFileTest, WritesAFileWithTheUsualModeAndReplacesItWithItsOwn) {
   TTempDir const dir;
+  mode_t const before = ::umask(026);
   WriteOutputFile(dir.Path("a"), "one");
+  ::umask(before);
+  EXPECT_EQ(static_cast<mode_t>(fs::status(dir.Path("a")).permissions()), 0640u);
+  fs::permissions(dir.Path("a"), fs::perms::owner_read | fs::perms::owner_write);
   WriteOutputFile(dir.Path("a"), "two");
   EXPECT_EQ(ReadFile(dir.Path("a")), "two");
+  EXPECT_EQ(static_cast<mode_t>(fs::status(dir.Path("a")).permissions()), 0600u);
   EXPECT_EQ(FilesIn(dir.Path()), 1u);
-  mode_t const mask = ::umask(0);
-  ::umask(mask);
-  EXPECT_EQ(static_cast<mode_t>(fs::status(dir.Path("a")).permissions()), 0666 & ~mask);
 }
 
-TEST(OutputFileTest, ADeviceALinkAndADirectoryAreNotReplaced) {
+TEST(OutputFileTest, APipeALinkAndADirectoryAreNotReplaced) {
   TTempDir const dir;
   fs::create_directory(dir.Path("d"));
   fs::create_symlink("/nowhere", dir.Path("link"));
-  for (std::string const& name : {dir.Path("d"), dir.Path("link"), std::string("/dev/null")})
+  ASSERT_EQ(::mkfifo(dir.Path("pipe").c_str(), 0600), 0);
+  for (std::string const& name : {dir.Path("d"), dir.Path("link"), dir.Path("pipe")})
     EXPECT_EQ(WhyRefused(name), name + " cannot be written: it is not a regular file");
-  EXPECT_EQ(FilesIn(dir.Path()), 2u);
+  EXPECT_EQ(FilesIn(dir.Path()), 3u);
   EXPECT_EQ(WhyRefused("/nowhere/a"), "/nowhere/a cannot be written: No such file or directory");
 }
 
