@@ -42,9 +42,9 @@ constexpr std::uint64_t kMostInstances = 2'000'000;
 constexpr std::uint64_t kMostValues = 50'000'000;  // including array elements and keys
 
 constexpr std::uint64_t kMostTraces = 100;  // descriptors, and processes, that a plug-in leaves: each is a line of a check
+constexpr std::uint64_t kMostUndefinedSymbols = 1'000;  // each is a line of a check, too
 
 // Bytes of the messages that are no namespaces: names, stages, times and failures.
-constexpr std::uint64_t kMostUndefinedSymbols = 1'000;  // each is a line of a check
 constexpr std::uint64_t kMostOtherBytes = 16 * 1024 * 1024;
 
 // How much of the limits above the namespaces of a plug-in have used.

@@ -48,8 +48,7 @@ void AskEvents(TRuleRun& run) {
     run.Add(events.fNewest, events.fSource, ESeverity::kError,
             "the controller's event log has a critical entry: " + text + " (" + AgeText(events.fAge) + often + ")",
             "Check the part that this sensor watches, its power and its cooling, and replace it if the event happens again. "
-            "After the "
-            "repair, clear the event log (ipmitool sel clear).");
+            "After the repair, clear the event log (ipmitool sel clear).");
   }
 }
 

@@ -38,7 +38,7 @@ void NoteProgress(char const* step, std::size_t done, std::size_t all) {
 }
 
 void Fill(TMemoryNamespace& ns) {
-  if (IsSampleDescribed()) return;
+  if (IsSampleDescribed() && gRemote == nullptr) return;
   FillControllerNamespace(ReadController(Connection(), MakeCache, NoteProgress), TMachineFiles::OfThisProcess(), ns);
 }
 

@@ -16,7 +16,7 @@ constexpr std::uint64_t kMicro = 1000000;
 TFinding<std::uint64_t> RecordsOf(TKernelLog const& log) {
   if (log.fIsWhole) return log.fRecords;
   return TMissing{kMissingUnreadable,
-                  "the time was up before the newest records were read; the oldest " + std::to_string(log.fRecords) + " were"};
+                  "the time was up when only the oldest " + std::to_string(log.fRecords) + " records had been read"};
 }
 
 TCIMDateTime TimeOf(TKernelMessage const& message, TRunningClock const& clock) {

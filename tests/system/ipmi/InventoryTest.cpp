@@ -286,7 +286,7 @@ TEST_F(InventoryTest, AControllerThatFallsSilentLeavesWhatWasReadInTime) {
                [](TRelay::TDatagram& datagram) { return datagram.fPlace < answers ? TRelay::AtOnce() : TRelay::TFate(); });
   auto const start = std::chrono::steady_clock::now();
   zep::TRun const run = Run({"127.0.0.1", "--inventory", "--json", "--timeout", "10"});
-  EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(11)) << "the library would wait for 21 s";
+  EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(16)) << "the library would wait for 21 s";
   EXPECT_EQ(run.fStatus, 2);
   json const document = json::parse(run.fOutput);
   EXPECT_THAT(std::string(document["reason"]), HasSubstr("inventory: not read to the end: "));

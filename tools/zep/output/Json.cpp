@@ -45,8 +45,8 @@ TJson WordsAsJson(TValueWords const& words, TCIMValue const& value) {
 
 // Whether the member contains a message or repeats an argument. All others contain data, which is printed unchanged.
 bool IsMessage(std::string_view key) {
-  constexpr std::string_view kMessages[] = {"reason", "error", "failure", "lastLogLine", "words",
-                                            "host",   "url",   "proxy",   "command"};
+  constexpr std::string_view kMessages[] = {"reason", "error", "exception", "failure", "lastLogLine",
+                                            "words",  "host",  "url",       "proxy",   "command"};
   return std::find(std::begin(kMessages), std::end(kMessages), key) != std::end(kMessages);
 }
 

@@ -53,6 +53,17 @@ TJson SectionOf(TJson const& document, std::string const& key) {
   return TJson::object();
 }
 
+TEST(ReportJsonTest, NoMessageOfAPlugInHasAPassword) {
+  TReport report = SampleReport();
+  char const* const message = "ftp://u:topsecret@h does not answer";
+  TPlugIn failed{"Test", "/usr/lib/libTest.nsp.so", 0, message, {}};
+  failed.fLastLogLine = failed.fWords = failed.fCause.fException = message;
+  report.fPlugIns.push_back(failed);
+  std::string const text = TReportDocument(report, EMessages::kWithoutSecrets).Text();
+  EXPECT_THAT(text, testing::HasSubstr("ftp://u:***@h"));
+  EXPECT_THAT(text, testing::Not(testing::HasSubstr("topsecret")));
+}
+
 TEST(ReportJsonTest, HasTheTablesOfTheTextReportAndTheUnits) {
   TReport const report = SampleReport();
   TJson const json = TJson::parse(TReportDocument(report, EMessages::kWithoutSecrets).Text());

@@ -20,7 +20,7 @@ TClasses ClassesByName(TContent const& content) {
   return classes;
 }
 
-// NULL says nothing that a wrong type could change.
+// The type of a NULL is not judged.
 void CheckTypesOf(TInstanceContent const& instance, TClassContent const& cls, TRuleResult& result) {
   for (TPropertyContent const& property : instance.fProperties) {
     TDeclaration const* const declaration = FindDeclaration(cls, property.fName);
