@@ -32,7 +32,7 @@ struct TCause {
 // The result of one provider that a plug-in registered.
 struct TProviderRun {
   std::string fName;
-  std::shared_ptr<TNamespaceView const> fView;  // null when the provider failed
+  std::shared_ptr<TNamespaceView const> fView;  // null when the provider failed before it had filled its namespace
   double fMilliseconds;                         // the time to fill the namespace
   std::string fError;                           // why the provider failed; empty when it succeeded
   std::string fStage = {};                      // the stage that failed: "registration" or "fill"; otherwise empty
@@ -86,7 +86,8 @@ std::vector<TPlugIn> LoadPlugIns(std::vector<TPlugInFile> const& files, std::opt
 // The same for the plug-ins that FindPlugIns finds. Throws TZEPException only if the plug-in directory cannot be read.
 std::vector<TPlugIn> LoadPlugIns(std::optional<TSample> const& sample = std::nullopt);
 
-// The namespaces of all providers that did not fail. A view shares ownership of its namespace with the plug-in.
+// The namespaces of all providers that filled them, even if some of the values cannot be read. A view shares ownership of its
+// namespace with the plug-in.
 std::vector<TNamespaceView> ViewsOf(std::vector<TPlugIn> const& plugIns);
 
 // Why the plug-in, or one of its providers, failed: "no disk (fill, libTest.nsp.so); last log line: [Error] no disk".

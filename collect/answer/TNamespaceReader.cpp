@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/answer/TNamespaceReader.h"
 
+#include "collect/FailureOf.h"
 #include "collect/answer/AnswerLimits.h"
 #include "collect/answer/NamespaceBytes.h"
 #include "collect/answer/TBadAnswer.h"
@@ -41,7 +42,7 @@ void TNamespaceReader::ReadClasses() {
   fChecker = TValueChecker(fClassCount, fCounts.fValues);
   ReadQualifierDecls();
   while (fNs.fClasses.size() < fClassCount) ReadClass();
-  fNs.fClassesFailure = ReadEnding();
+  fNs.fClassesFailure = ReadEnding("the classes");
 }
 
 boost::shared_ptr<TReceivedNamespace> TNamespaceReader::Finish() {
@@ -110,7 +111,8 @@ void TNamespaceReader::ReadPropertyDecl(boost::shared_ptr<TReceivedClass> const&
   facts.fType = ReadType();
   unsigned int const flags = fReader.Byte();
   facts.fIsKey = (flags & kKeyFlag) != 0;
-  if ((flags & kKeyFailedFlag) != 0) facts.fKeyFailure = TRecordedFailure::ReadFrom(fReader);
+  if ((flags & kKeyFailedFlag) != 0)
+    facts.fKeyFailure = ReadFailure("the property " + name + " of " + cls->GetName(TCIMContext()));
   if ((flags & kOwnerFlag) != 0) facts.fOwner = cls;
   facts.fDefaultAt = ReadValuePosition();
   auto const decl = boost::make_shared<TReceivedPropertyDecl>(fNamespace, name, facts);
@@ -124,7 +126,8 @@ void TNamespaceReader::ReadStaticProperties(boost::shared_ptr<TReceivedClass> co
     fNs.fStaticProperties.push_back({name, ReadDecl()});
     cls->Add(boost::make_shared<TReceivedProperty>(fNamespace, fNs.fStaticProperties.back(), ReadValuePosition()));
   }
-  if (auto const failure = ReadEnding()) cls->EndStaticPropertiesWith(*failure);
+  if (auto const failure = ReadEnding("the static properties of " + cls->GetName(TCIMContext())))
+    cls->EndStaticPropertiesWith(*failure);
 }
 
 void TNamespaceReader::ReadMethod(boost::shared_ptr<TReceivedClass> const& cls) {
@@ -159,14 +162,14 @@ void TNamespaceReader::ReadTree(std::size_t root) {
     else
       throw TBadAnswer("a record has the kind " + std::to_string(record));
   }
-  tree.fFailure = ReadEnding();
+  tree.fFailure = ReadEnding("the instances of " + NameOf(root));
   tree.fEnd = fNs.fInstances.size();
 }
 
 void TNamespaceReader::ReadLayout() {
   TReceivedLayout layout;
   layout.fClass = static_cast<std::size_t>(fReader.NumberUpTo(fClassCount - 1, "the class of an instance"));
-  layout.fClassFailure = ReadEnding();
+  layout.fClassFailure = ReadEnding("the class of an instance of " + NameOf(layout.fClass));
   std::size_t const count = CountOf("the number of properties");
   for (std::size_t n = 0; n < count; ++n) {
     std::string const name = ReadName();
@@ -183,11 +186,15 @@ void TNamespaceReader::ReadInstance() {
   if (number >= fNs.fLayouts.size()) throw TBadAnswer("an instance has a layout that does not exist");
   TReceivedLayout const& layout = fNs.fLayouts[static_cast<std::size_t>(number)];
   fNs.fInstances.push_back(boost::make_shared<TReceivedInstance>(fNamespace, layout, fReader.At()));
-  for (std::size_t n = 0; n < layout.fProperties.size(); ++n) {
-    if (IsMissingValue(fReader))
-      TRecordedFailure::ReadFrom(fReader);
+  for (TReceivedPropertyName const& property : layout.fProperties) {
+    bool const isMissing = IsMissingValue(fReader);
+    if (!isMissing) fChecker.CheckValue(fReader);
+    if (!isMissing && !fChecker.TakeForeignType()) continue;
+    std::string const place = "the property " + property.fName + " of an instance of " + NameOf(layout.fClass);
+    if (isMissing)
+      ReadFailure(place);
     else
-      fChecker.CheckValue(fReader);
+      Note(place, "its type does not exist");
   }
   ReadPath(layout);
 }
@@ -195,7 +202,7 @@ void TNamespaceReader::ReadInstance() {
 void TNamespaceReader::ReadPath(TReceivedLayout const& layout) {
   unsigned int const kind = fReader.Byte();
   if (kind == kPathFailed) {
-    TRecordedFailure::ReadFrom(fReader);
+    ReadFailure("the path of an instance of " + NameOf(layout.fClass));
   } else if (kind == kPathApart) {
     fChecker.CheckReference(fReader);
   } else if (kind == kPathOfKeys) {
@@ -244,9 +251,21 @@ boost::shared_ptr<TReceivedPropertyDecl> TNamespaceReader::ReadDecl() {
   return decls[static_cast<std::size_t>(number)];
 }
 
-std::optional<TRecordedFailure> TNamespaceReader::ReadEnding() {
-  if (fReader.Byte() == 0) return std::nullopt;
-  return TRecordedFailure::ReadFrom(fReader);
+TRecordedFailure TNamespaceReader::ReadFailure(std::string const& place) {
+  TRecordedFailure failure = TRecordedFailure::ReadFrom(fReader);
+  Note(place, FailureOf([&] { failure.Throw(); }));
+  return failure;
 }
+
+void TNamespaceReader::Note(std::string const& place, std::string const& failure) {
+  if (fFirstFailure.empty()) fFirstFailure = place + ": " + failure;
+}
+
+std::optional<TRecordedFailure> TNamespaceReader::ReadEnding(std::string const& place) {
+  if (fReader.Byte() == 0) return std::nullopt;
+  return ReadFailure(place);
+}
+
+std::string TNamespaceReader::NameOf(std::size_t cls) const { return fNs.fClasses[cls]->GetName(TCIMContext()); }
 
 }  // namespace NQRVZEP20

@@ -20,6 +20,10 @@ public:
   // Reads the rest, which must be complete, and returns the namespace. Call it once. Throws TBadAnswer.
   boost::shared_ptr<TReceivedNamespace> Finish();
 
+  // What the provider could not answer, with its place: "the property Size of an instance of X_Disk: no disk". Of several the
+  // first; empty if there is none. The namespace throws it when it is asked for the same.
+  std::string const& FirstFailure() const { return fFirstFailure; }
+
 private:
   using TQualifiers = std::vector<boost::shared_ptr<TReceivedQualifier>>;
 
@@ -41,7 +45,10 @@ private:
   TCIMValue::TCIMType ReadType();
   std::size_t ReadValuePosition();  // checks the value
   boost::shared_ptr<TReceivedPropertyDecl> ReadDecl();
-  std::optional<TRecordedFailure> ReadEnding();
+  TRecordedFailure ReadFailure(std::string const& place);
+  void Note(std::string const& place, std::string const& failure);
+  std::optional<TRecordedFailure> ReadEnding(std::string const& place);
+  std::string NameOf(std::size_t cls) const;
 
   boost::shared_ptr<TReceivedNamespace> const fNamespace;
   TReceivedNamespace& fNs;
@@ -49,6 +56,7 @@ private:
   TByteReader fReader;
   bool fHasClasses = false;
   std::size_t fClassCount = 0;
+  std::string fFirstFailure;
   TValueChecker fChecker;
   std::vector<std::size_t> fDepths;  // of the classes
   std::vector<std::size_t> fKeyOf;   // by property of the layout: the last instance whose path has it as a key, from 1

@@ -280,6 +280,7 @@ void TValueChecker::CheckValue(TByteReader& reader, std::uint64_t depth) {
   if (++*fValues > kMostValues) throw TBadAnswer("there are more than " + std::to_string(kMostValues) + " values");
   TTag const tag = ReadTag(reader);
   if (!tag.fIsNull) return CheckData(reader, tag.fType, depth);
+  if ((tag.fType & ~unsigned{TType::kCIMTypeArrayFlag}) > TType::kCIMTypeReference) fHasForeignType = true;
   if (IsArrayTag(tag.fType)) reader.NumberUpTo(std::numeric_limits<unsigned int>::max(), "the bound of an array");
   if (tag.fType == TType::kCIMTypeReference) CheckClass(reader);
 }

@@ -9,6 +9,7 @@
 #include <cstdint>
 #include <map>
 #include <string>
+#include <utility>
 
 namespace NQRVZEP20 {
 
@@ -34,12 +35,16 @@ public:
   void CheckValue(TByteReader& reader, std::uint64_t depth = 0);
   void CheckReference(TByteReader& reader, std::uint64_t depth = 0);
 
+  // Whether a value since the last call was a NULL of a type that does not exist, which cannot be shown.
+  bool TakeForeignType() { return std::exchange(fHasForeignType, false); }
+
 private:
   void CheckClass(TByteReader& reader) const;
   void CheckData(TByteReader& reader, unsigned int type, std::uint64_t depth);
 
   std::size_t fClasses;
   std::uint64_t* fValues;
+  bool fHasForeignType = false;
 };
 
 // Skips a value that has been validated.

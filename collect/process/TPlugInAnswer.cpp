@@ -117,8 +117,18 @@ void TPlugInAnswer::TakeNamespace(std::string const& microseconds) {
   run->fMilliseconds = *milliseconds;
   std::string const failure =
       FailureOf([&] { run->fView = std::make_shared<TNamespaceView>(run->fName, fNamespace->Finish(), fSampleLabel); });
-  if (!failure.empty()) Fail({failure});
+  if (!failure.empty())
+    Fail({failure});
+  else if (!fNamespace->FirstFailure().empty())
+    NoteUnread(*run);
   EndFill();
+}
+
+// The rest of the namespace is used.
+void TPlugInAnswer::NoteUnread(TProviderRun& run) {
+  run.fError = Shortened("its answer is incomplete: " + fNamespace->FirstFailure(), kLongestFailure);
+  run.fStage = NameOf(EStage::kFill);
+  run.fLastLogLine = fLastLogLine();
 }
 
 // A cost without a class is that of the load or the fill that is under way.

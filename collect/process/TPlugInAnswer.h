@@ -58,6 +58,7 @@ private:
   void TakeClasses();
   void TakeExit(std::string const& status);
   void TakeNamespace(std::string const& microseconds);
+  void NoteUnread(TProviderRun& run);
   void TakeCost(std::string const& bytes);
   void TakeTrace(TMessage const& message);
   void TakeUndefined(std::string const& symbol);

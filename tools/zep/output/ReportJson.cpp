@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/output/ReportJson.h"
 
+#include "ICIMClass.h"
 #include "ICIMInstance.h"
+#include "TAddToVectorCallback.h"
 #include "collect/FailureOf.h"
 #include "collect/Sections.h"
 #include "tools/zep/output/FindingsJson.h"
@@ -79,6 +81,20 @@ void AppendElement(std::string& array, std::string_view lines) {
   array += lines;
 }
 
+// The instances, without those that follow a failure in their tree of classes. `failure`: the first one.
+std::vector<boost::shared_ptr<ICIMInstance>> ReadableInstances(TNamespaceView const& view, std::string& failure) {
+  std::vector<boost::shared_ptr<ICIMInstance>> instances;
+  auto const addOf = [&](boost::shared_ptr<ICIMClass> const& rootClass) {
+    std::string const why =
+        FailureOf([&] { rootClass->EnumerateInstances(TAddToVectorCallback<ICIMInstance>(instances), TCIMContext()); });
+    if (failure.empty()) failure = why;
+    return true;
+  };
+  std::string const why = FailureOf([&] { view.Get()->EnumerateClasses(addOf, TCIMContext()); });
+  if (failure.empty()) failure = why;
+  return instances;
+}
+
 }  // namespace
 
 TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fMessages(messages), fPlugIns(&report.fPlugIns) {
@@ -149,19 +165,19 @@ TJson TReportDocument::WriteInstances(TWriter const& write) const {
   return failures;
 }
 
-// Converts one instance after the other. A namespace that fails is left there and is part of the result; what `use` throws is
-// passed on.
+// Converts one instance after the other. An instance that cannot be read is left out, and the first of a namespace is part of the
+// result; what `use` throws is passed on.
 TJson TReportDocument::ForEachInstance(std::function<void(TJson instance)> const& use) const {
   TJson failures = TJson::array();
   if (fPlugIns == nullptr) return failures;
   for (TNamespaceView const& view : ViewsOf(*fPlugIns)) {
     TInstanceJson json(view);
-    std::vector<boost::shared_ptr<ICIMInstance>> instances;
-    std::string failure = FailureOf([&] { instances = view.AllInstances(); });
-    for (auto instance = instances.begin(); instance != instances.end() && failure.empty(); ++instance) {
+    std::string failure;
+    for (auto const& instance : ReadableInstances(view, failure)) {
       TJson element;
-      failure = FailureOf([&] { element = json.Of(**instance); });
-      if (failure.empty()) use(std::move(element));
+      std::string const why = FailureOf([&] { element = json.Of(*instance); });
+      if (why.empty()) use(std::move(element));
+      if (failure.empty()) failure = why;
     }
     if (!failure.empty()) failures.push_back({{"provider", view.GetProviderName()}, {"error", failure}});
   }

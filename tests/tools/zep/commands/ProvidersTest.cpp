@@ -85,11 +85,13 @@ TEST_F(ProvidersTest, EachMisdeedCostsItsOwnRow) {
       {"LoadCrashes", "static construction", "it was killed by SIGSEGV (Segmentation fault)", nullptr},
       {"LoadExits", "static construction", "it exited with status 3", nullptr},
       {"RegistrationThrows", "registration", "it has no name", nullptr},
+      {"AnswersBroken", "fill",
+       "its answer is incomplete: the property no name: \xef\xbf\xbd of an instance of X_Own: its type does not exist", nullptr},
       {"RegistersNull", "registration", "kZEPStatusFail (it registers an empty pointer)", nullptr},
   };
   for (TRow const& row : rows) Add({row.fName});
   std::vector<std::string> const harmless = {
-      "ChangesDirectory",     "LimitsItself",          "Prints", "Forks", "ForksTwice", "Reads", "AnswersBroken",
+      "ChangesDirectory",     "LimitsItself",          "Prints", "Forks", "ForksTwice", "Reads",
       "LeavesThrowingStatic", "ProviderThrowsAtItsEnd"};
   Add(harmless);
   TRun const run = Run({"report", "--json"});
@@ -296,5 +298,21 @@ TEST_F(ProvidersTest, TheRowOfAFailureNamesFileProviderStageCauseAndLogLine) {
             "log line: [Error] about to crash\n");
   EXPECT_EQ(Run({"show", "CIM_Chassis"}).fStatus, 2);
 }
+
+TEST_F(ProvidersTest, APlugInWithAValueThatCannotBeReadFailsButTheRestOfItsAnswerIsUsed) {
+  Add({"AnswersBroken"});
+  std::string const error =
+      "its answer is incomplete: the property no name: \\xff of an instance of X_Own: its type does not exist";
+  TRun const report = Run({"report"});
+  EXPECT_EQ(report.fStatus, 2);
+  std::string const words = std::regex_replace(report.fOutput, std::regex("\\s+"), " ");
+  EXPECT_THAT(words, HasSubstr("provider AnswersBroken failed: " + error + " (fill, libAnswersBroken.nsp.so)"));
+  EXPECT_EQ(Run({"plugins"}).fStatus, 2);
+  TRun const show = Run({"show", "X_Own"});
+  EXPECT_EQ(show.fStatus, 2);
+  EXPECT_THAT(show.fOutput, HasSubstr("root/own:X_Own"));
+  EXPECT_THAT(show.fErrors, HasSubstr(error));
+}
+
 }  // namespace
 }  // namespace NQRVZEP20::zep
