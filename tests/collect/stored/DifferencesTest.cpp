@@ -79,6 +79,7 @@ TEST(DifferencesTest, WithinWhatAlwaysChangesReportsAreTheSame) {
     bool fIsSame;
   } const rows[] = {
       {"ZEP_RunningState", "Uptime", "1", "2", "", true},
+      {"ZEP_RunningState", "LoadOfOneMinute", "1", "2", "", true},
       {"CIM_OperatingSystem", "FreePhysicalMemory", "1", "2", "", true},
       {"ZEP_InterfaceStatistics", "BytesReceived", "1", "2", "", true},
       {"ZEP_InterfaceStatistics", "ReceiveErrors", "1", "2", "", false},
