@@ -29,7 +29,7 @@ holds libzepcore-ipmi libController.nsp.so
 dpkg-deb --fsys-tarfile "$work"/packages/libzepcore-ipmi_*.deb | tar -xO ./usr/share/doc/libzepcore-ipmi/copyright >"$work/log"
 grep -q '^License: GPL-3.0-or-later$' "$work/log" || fail "libzepcore-ipmi does not state its licence:" "$work/log"
 
-# The maintainer's address is that of whoever makes the packages (ZEP_PACKAGE_CONTACT).
+# The address of the maintainer is that of the person who makes the packages (ZEP_PACKAGE_CONTACT).
 if command -v lintian >/dev/null; then
   lintian --allow-root --suppress-tags bogus-mail-host,bogus-mail-host-in-debian-changelog "$work"/packages/*.deb >"$work/log" 2>&1 ||
     fail "lintian fails:" "$work/log"
