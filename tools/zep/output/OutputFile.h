@@ -6,9 +6,9 @@
 namespace NQRVZEP20::zep {
 
 // Writes a file that appears under its name only when it is complete and on the disk: the text goes to a temporary file in the
-// same directory, which is then renamed. A regular file of that name is replaced and keeps its permissions. Throws TFailure with
-// kExitNotWritten and leaves nothing behind if the file cannot be written, or if a directory, a symbolic link or a device has its
-// name.
+// same directory, which is then renamed. A regular file of that name is replaced and keeps its permissions. A directory, a
+// symbolic link or a device is not replaced. If the file cannot be written, throws TFailure with kExitNotWritten; the temporary
+// file is removed.
 void WriteOutputFile(std::string const& file, std::string const& text);
 
 }  // namespace NQRVZEP20::zep
