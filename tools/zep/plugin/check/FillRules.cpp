@@ -28,7 +28,8 @@ void CheckFill(TObservation const& observation, TRuleResult& result) {
   if (trial.fPlugIn.fProviders.empty()) return result.CannotCheck("no provider is registered");
   if (!trial.fPlugIn.fError.empty()) result.Find("after the fill", MessageWithoutSecrets(trial.fPlugIn.fError));
   for (TProviderRun const& run : trial.fPlugIn.fProviders)
-    if (run.fStage == NameOf(EStage::kFill) && run.fCause.fLimit.empty() && !run.fView) result.Find(PlaceOf(run), FailureOfRun(run));
+    if (run.fStage == NameOf(EStage::kFill) && run.fCause.fLimit.empty() && !run.fView)
+      result.Find(PlaceOf(run), FailureOfRun(run));
   for (TContent const& content : trial.fContents)
     for (TIssue const& failure : content.fFailures) result.Find(failure.fPlace, failure.fText);
 }
