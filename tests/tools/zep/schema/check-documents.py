@@ -6,7 +6,8 @@
 
 SCHEMAS: the directory with *.schema.json. MEMBERS: the directory that lists the members of each version. DOCUMENTS: a directory
 of documents, each in a file *.json. Every schema must be valid, and no member of a version may change or go: members-VERSION.txt
-has a line for each, with its type. A new member is added to the list with --record in place of DOCUMENTS.
+has a line for each, with its type. A new member is added to the list with --record in place of DOCUMENTS. A directory without
+documents proves nothing: the exit status is then 77, which ctest shows as skipped, or 1 with CI=true.
 """
 import json
 import multiprocessing
@@ -14,12 +15,13 @@ import os
 import sys
 from pathlib import Path
 
+SKIPPED = 1 if os.environ.get("CI") == "true" else 77  # the exit status
+
 try:
     from jsonschema import Draft202012Validator
 except ImportError:
     print("the package python3-jsonschema is not installed")
-    sys.exit(1 if os.environ.get("CI") == "true" else 77)
-
+    sys.exit(SKIPPED)
 
 KIND = ("type", "const", "enum", "$ref")
 
@@ -104,6 +106,9 @@ def main():
     with multiprocessing.Pool() as pool:
         for found in pool.imap_unordered(problems_of, paths, 4):
             problems += found
+    if documents and not paths and not problems:
+        print(f"no documents in {documents}: no test kept one")
+        sys.exit(SKIPPED)
     print("\n".join(problems[:50]) or f"{len(paths)} documents and {len(checkers)} schemas are valid")
     sys.exit(1 if problems else 0)
 
