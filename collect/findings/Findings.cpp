@@ -32,6 +32,13 @@ std::size_t TFindings::CountOf(TRuleResult::EOutcome outcome) const {
   return std::count_if(fRules.begin(), fRules.end(), [&](TRuleResult const& rule) { return rule.fOutcome == outcome; });
 }
 
+TRuleCounts TFindings::CountRules() const {
+  auto const idle = static_cast<std::size_t>(
+      std::count_if(fRules.begin(), fRules.end(), [](TRuleResult const& rule) { return rule.HasNothingToExamine(); }));
+  std::size_t const notAsked = CountOf(EOutcome::kNotAsked);
+  return {fRules.size() - idle - notAsked, idle, notAsked};
+}
+
 std::string NameOf(TRuleResult::EOutcome outcome) {
   switch (outcome) {
     case EOutcome::kFine:

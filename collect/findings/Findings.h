@@ -23,6 +23,14 @@ struct TRuleResult {
   EOutcome fOutcome;
   std::size_t fExamined;             // the number of values examined
   std::vector<TNotAsked> fNotAsked;  // may also be there when other elements were examined
+
+  // Whether this machine has nothing that the rule judges, such as a RAID array. The outcome is kFine then.
+  bool HasNothingToExamine() const { return fOutcome == EOutcome::kFine && fExamined == 0; }
+};
+
+// Each rule is counted in one of them.
+struct TRuleCounts {
+  std::size_t fAsked, fWithNothingToExamine, fNotAsked;
 };
 
 // What is wrong with this machine.
@@ -34,6 +42,7 @@ struct TFindings {
   // The highest severity of the problems; none without problems.
   std::optional<ESeverity> Worst() const;
   std::size_t CountOf(TRuleResult::EOutcome outcome) const;
+  TRuleCounts CountRules() const;
 };
 
 // For programs: "fine", "wrong" and "not-asked".

@@ -54,8 +54,9 @@ void AskDifferentModules(TRuleRun& run) {
   std::map<std::string, std::vector<TElement>> channels;
   auto const modules = run.Elements("CIM_PhysicalMemory");
   for (TElement const& module : modules)
-    if (run.Know(module, module.Number("Capacity")))
-      if (std::string const channel = ChannelOf(module); !channel.empty()) channels[channel].push_back(module);
+    if (std::string const channel = ChannelOf(module); !channel.empty() && run.Know(module, module.Number("Capacity")))
+      channels[channel].push_back(module);
+  if (channels.empty() && modules.size() > 1) run.NoteNotAsked({"the firmware does not name the channels of the modules", ""});
   for (auto const& [channel, members] : channels) {
     std::string const difference = DifferenceIn(members, {"Capacity", "MemoryType", "MaxMemorySpeed"});
     if (!difference.empty())

@@ -32,7 +32,10 @@ void AskSensors(TRuleRun& run) {
 }
 
 void AskFans(TRuleRun& run) {
-  for (TElement const& sensor : run.Elements("CIM_NumericSensor")) {
+  auto const sensors = run.Elements("CIM_NumericSensor");
+  bool const hasFan = std::any_of(sensors.begin(), sensors.end(), [](TElement const& each) { return Is(each, kTachometer); });
+  if (!sensors.empty() && !hasFan) run.NoteNotAsked({"no sensor measures the speed of a fan", ""});
+  for (TElement const& sensor : sensors) {
     if (!Is(sensor, kTachometer)) continue;
     auto const state = sensor.Text("CurrentState"), reading = sensor.Text("CurrentReading");
     if (!run.Know(sensor, state)) continue;

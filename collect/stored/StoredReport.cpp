@@ -120,7 +120,8 @@ TStoredProblem ProblemOf(TStoredNode const& node) {
 }
 
 TStoredRule RuleOf(TStoredNode const& node) {
-  return {node.TextOf("id"), node.TextOf("question"), WordOf(node, "outcome", {"fine", "wrong", "not-asked"}),
+  std::string const outcome = WordOf(node, "outcome", {"fine", "wrong", "not-asked"});
+  return {node.TextOf("id"), node.TextOf("question"), outcome, outcome == "fine" && node.Member("examined").Number() == 0,
           node.Member("notExamined").Elements([](TStoredNode const& element) { return element.TextOf("reason"); })};
 }
 

@@ -54,6 +54,7 @@ struct TStoredProblem {
 
 struct TStoredRule {
   std::string fId, fQuestion, fOutcome;   // "fine", "wrong" or "not-asked"
+  bool fHasNothingToExamine;              // the outcome is "fine", and no value was examined
   std::vector<std::string> fNotExamined;  // the reasons
 };
 

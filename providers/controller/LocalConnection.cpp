@@ -34,7 +34,7 @@ TFinding<std::string> FindDevice() {
     if (::access(device, R_OK | W_OK) != 0) return WhyNotOpened(device, errno);
     return std::string(device);
   }
-  return TMissing{kMissingNotGiven,
+  return TMissing{kMissingNoSource,
                   "the kernel has no /dev/ipmi0: this machine has no management controller, or the modules ipmi_si and "
                   "ipmi_devintf are not loaded"};
 }

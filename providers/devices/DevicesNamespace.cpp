@@ -64,7 +64,8 @@ void WritePci(TRecordWriter& writer, TMachineFiles const& files, TComputerSystem
   TRecords links;
   for (TPciFunction const& function : functions)
     if (function.fLink) links.push_back(function.fLink->fRecord);
-  writer.Write(PciLinkShape(system), links, {kMissingNotGiven, "the kernel lists no PCI Express devices"});
+  writer.Write(PciLinkShape(system), links,
+               functions.empty() ? whyNone : TMissing{kMissingNotGiven, "the kernel lists no PCI Express devices"});
 }
 
 void TiePci(TRecordWriter& writer, TRecord const& system, std::vector<TPciFunction> const& functions) {

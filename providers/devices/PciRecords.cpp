@@ -231,7 +231,7 @@ TRecord PciBridgeShape(TComputerSystem const& system) { return BridgeRecord(syst
 TRecord PciLinkShape(TComputerSystem const& system) { return LinkOf(system, "", TPciFiles()).fRecord; }
 
 TMissing WhyNoPciDevices(TMachineFiles const& files) {
-  if (!files.Exists(kDevices)) return {kMissingNotGiven, "the kernel lists no PCI devices: " + kDevices + " does not exist"};
+  if (!files.Exists(kDevices)) return {kMissingNoSource, "the kernel lists no PCI devices: " + kDevices + " does not exist"};
   return {kMissingNotGiven, "no PCI devices are listed in " + kDevices};
 }
 

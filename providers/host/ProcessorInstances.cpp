@@ -106,7 +106,7 @@ void WriteCores(THostContext const& host, TProcessorInstances& instances) {
 
 void WriteWeaknesses(THostContext const& host) {
   auto const& files = host.fHardwareFiles;
-  TMissing const none{kMissingNotGiven, "the kernel lists no weaknesses in /sys/devices/system/cpu/vulnerabilities"};
+  TMissing const none{kMissingNoSource, "the kernel lists no weaknesses in /sys/devices/system/cpu/vulnerabilities"};
   host.fWriter.Write(WeaknessRecord("", none), files ? WeaknessRecords(*files) : std::vector<TRecord>(),
                      files ? none : files.Why());
 }

@@ -12,11 +12,12 @@ struct TMissing {
 };
 
 // Codes of providers.
-constexpr char const* kMissingNoTables = "no-smbios";          // the system exports no SMBIOS tables
-constexpr char const* kMissingNeedsRoot = "needs-root";        // only root may read the source
-constexpr char const* kMissingUnreadable = "unreadable";       // the source cannot be read for another reason
-constexpr char const* kMissingPlaceholder = "placeholder";     // the source contains a placeholder text instead of a value
-constexpr char const* kMissingNotGiven = "not-given";          // the source omits the value or reports it as unknown
+constexpr char const* kMissingNoTables = "no-smbios";       // the system exports no SMBIOS tables
+constexpr char const* kMissingNeedsRoot = "needs-root";     // only root may read the source
+constexpr char const* kMissingUnreadable = "unreadable";    // the source cannot be read for another reason
+constexpr char const* kMissingPlaceholder = "placeholder";  // the source contains a placeholder text instead of a value
+constexpr char const* kMissingNotGiven = "not-given";       // the source omits the value or reports it as unknown
+constexpr char const* kMissingNoSource = "no-source";       // a driver, counter, program or device that would show it is missing
 constexpr char const* kMissingUnexpected = "unexpected-form";  // the source contains something that is not a valid value
 
 // Codes of front ends.

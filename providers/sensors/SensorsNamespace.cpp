@@ -21,7 +21,7 @@ constexpr TAssociation kLogManagesRecord{"CIM_LogManagesRecord", "Log", "CIM_Log
 using TRecords = std::vector<TRecord>;
 
 TMissing NoneIn(char const* directory, char const* elements) {
-  return {kMissingNotGiven, std::string("the kernel lists no ") + elements + " in " + directory};
+  return {kMissingNoSource, std::string("the kernel lists no ") + elements + " in " + directory};
 }
 
 void WriteSensors(TRecordWriter& writer, TMachineFiles const& files, TComputerSystem const& system) {
@@ -86,7 +86,7 @@ void FillSensorsNamespace(TMachineFiles const& files, TMemoryNamespace& ns) {
   WriteErrors(writer, system.Record(), ReadMemoryErrors(files), MemoryErrorsRecord,
               NoneIn("/sys/devices/system/edac/mc", "memory controllers"));
   WriteErrors(writer, system.Record(), ReadPciErrors(files), PciErrorsRecord,
-              {kMissingNotGiven, "the kernel counts the errors of no PCI Express device"});
+              {kMissingNoSource, "the kernel counts the errors of no PCI Express device"});
   WritePowerSupplies(writer, files, system);
   WriteKernelLog(writer, files, system.Record());
   writer.WriteMissing();

@@ -25,7 +25,7 @@ void WriteHealth(TStorage& storage) {
       ofDrives.emplace_back(name, attributes.back());
     }
   }
-  TMissing const noReport{kMissingNotGiven,
+  TMissing const noReport{storage.fDisks.empty() ? kMissingNotGiven : kMissingNoSource,
                           "no disk has a report of its health: the property HealthState of each disk has the reason"};
   TMissing const noAttributes{kMissingNotGiven, "no disk has a table of SMART attributes that smartctl could read"};
   storage.fWriter.Write(HealthRecord("", NoSmartReport(noReport)), records, noReport);

@@ -40,13 +40,6 @@ TEST(ControllerRulesTest, ACriticalEntryIsNamedWithItsAge) {
   EXPECT_THAT(Problems(rule, OnController(Entry(1, event, kCritical, 31 * kDay)), thresholds), testing::SizeIs(1));
 }
 
-// The reason why a value is missing. `path`: of its instance, with escaped quotation marks.
-std::string Missing(std::string const& path, std::string const& property, std::string const& code) {
-  return "class ZEP_MissingValue { string ElementPath; string ElementProperty; string Code; string Reason; };"
-         "instance of ZEP_MissingValue { ElementPath = \"" +
-         path + "\"; ElementProperty = \"" + property + "\"; Code = \"" + code + "\"; Reason = \"a reason\"; };";
-}
-
 std::string Log(std::string const& state) {
   return OnController("instance of ZEP_EventLog { InstanceID = \"l\"; " + state + " };");
 }

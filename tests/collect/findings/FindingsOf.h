@@ -49,7 +49,7 @@ inline constexpr char const* kRuleClasses = R"(
   class CIM_NumericSensor : CIM_Sensor { sint32 CurrentReading; sint32 UnitModifier; };
   class ZEP_ManagementController { [key] string DeviceID; };
   class ZEP_ControllerAccount { [key] string Name; string UserID; uint16 EnabledState; string Privilege; boolean HasLANAccess; };
-  class ZEP_EventLog { [key] string InstanceID; [ValueSource("free")] uint64 FreeRecords;
+  class ZEP_EventLog { [key] string InstanceID; uint64 CurrentNumberOfRecords; [ValueSource("free")] uint64 FreeRecords;
     [ValueSource("lost")] boolean HasLostRecords; datetime ClockTime; };
   class ZEP_EventLogEntry { [key] string RecordID; string RecordData; uint16 PerceivedSeverity; uint64 Age; boolean HasEnded; };
   class ZEP_MemoryErrors { [key] string InstanceID; string ElementName; uint64 CorrectedErrors; uint64 UncorrectedErrors; };
@@ -74,6 +74,13 @@ inline TFindings FindingsOf(std::string const& instances, TThresholds const& thr
   ReadMofFile(SourcePath("collect/findings/ZEP_Finding.mof"), ns);
   ReadMofText(instances, "instances", ns);
   return MakeFindings({TNamespaceView("Test", ns)}, thresholds);
+}
+
+// The reason why a value is missing. `path`: of its instance, with escaped quotation marks.
+inline std::string Missing(std::string const& path, std::string const& property, std::string const& code) {
+  return "class ZEP_MissingValue { string ElementPath; string ElementProperty; string Code; string Reason; };"
+         "instance of ZEP_MissingValue { ElementPath = \"" +
+         path + "\"; ElementProperty = \"" + property + "\"; Code = \"" + code + "\"; Reason = \"a reason\"; };";
 }
 
 // The problems that the rule finds, as "severity: reason".

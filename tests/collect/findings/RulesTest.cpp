@@ -324,7 +324,7 @@ TEST(RulesTest, ModulesAreComparedWithinTheirChannel) {
   EXPECT_THAT(Problems("memory-differs", Module("0", "P0 CHANNEL A", "8") + Module("1", "P0 CHANNEL A", "16")),
               ElementsAre("warning: the memory modules of the channel P0 CHANNEL A do not match (Capacity: 16, 8)"));
   EXPECT_THAT(Problems("memory-differs", Module("0", "P0 CHANNEL A", "8") + Module("1", "P0 CHANNEL B", "16")), IsEmpty());
-  EXPECT_THAT(Problems("memory-differs", Module("0", "BANK 0", "8") + Module("1", "BANK 0", "16")), IsEmpty());
+  EXPECT_EQ(Outcome("memory-differs", Module("0", "BANK 0", "8") + Module("1", "BANK 0", "16")), "not-asked");
 }
 
 TEST(RulesTest, WeaknessesWithoutMitigationAreListed) {
@@ -386,6 +386,24 @@ TEST(RulesTest, NothingIsWrongWithoutInstances) {
   auto const findings = FindingsOf("");
   EXPECT_THAT(findings.fProblems, IsEmpty());
   EXPECT_EQ(findings.CountOf(TRuleResult::EOutcome::kFine), findings.fRules.size());
+}
+
+TEST(RulesTest, ARuleWithNothingToExamineIsCountedApart) {
+  auto const findings = FindingsOf(State("Taint = 0;"));
+  auto const counts = findings.CountRules();
+  EXPECT_EQ(counts.fAsked + counts.fWithNothingToExamine + counts.fNotAsked, findings.fRules.size());
+  EXPECT_FALSE(ResultOf("kernel-taint", findings).HasNothingToExamine());
+  EXPECT_TRUE(ResultOf("array-degraded", findings).HasNothingToExamine());
+  EXPECT_FALSE(ResultOf("failed-units", findings).HasNothingToExamine()) << "it could not be asked";
+}
+
+TEST(RulesTest, ARuleWhoseSourceIsMissingIsNotAsked) {
+  auto const findings = FindingsOf(Missing("CIM_NumericSensor", "", "no-source"));
+  for (char const* rule : {"sensor-threshold", "fan-stopped"}) {
+    auto const& result = ResultOf(rule, findings);
+    EXPECT_EQ(NameOf(result.fOutcome), "not-asked") << rule;
+    EXPECT_EQ(result.fNotAsked.at(0).fReason, "a reason") << rule;
+  }
 }
 
 TEST(RulesTest, WithoutProvidersNoRuleCanBeAskedButThatOfPlugIns) {

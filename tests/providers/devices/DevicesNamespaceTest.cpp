@@ -34,7 +34,9 @@ TEST_F(DevicesNamespaceTest, AMachineWithoutFilesHasReasons) {
   EXPECT_EQ(reasons.WhyNoInstance("CIM_USBHub")->fReason,
             "the kernel lists no USB devices: /sys/bus/usb/devices/ does not exist");
   EXPECT_EQ(reasons.WhyNoInstance("CIM_Slot")->fReason, "the kernel lists no PCI slots in /sys/bus/pci/slots");
-  EXPECT_EQ(reasons.WhyNoInstance("ZEP_PCIExpressLink")->fReason, "the kernel lists no PCI Express devices");
+  EXPECT_EQ(reasons.WhyNoInstance("ZEP_PCIExpressLink")->fReason,
+            "the kernel lists no PCI devices: /sys/bus/pci/devices/ does not exist");
+  EXPECT_EQ(reasons.WhyNoInstance("ZEP_PCIExpressLink")->fCode, kMissingNoSource) << "no rule about links can be asked";
   EXPECT_EQ(TextOf(*fNs), "CIM_ComputerSystem.CreationClassName=\"CIM_ComputerSystem\"\n");
 }
 

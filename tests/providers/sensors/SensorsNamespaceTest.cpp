@@ -92,6 +92,8 @@ TEST_F(SensorsNamespaceTest, AMachineWithoutFilesHasReasons) {
   for (char const* name : {"ZEP_KernelLog", "ZEP_KernelLogRecord"})
     EXPECT_EQ(reasons.WhyNoInstance(name)->fCode, kMissingUnreadable) << name;
   EXPECT_EQ(reasons.WhyNoInstance("ZEP_PCIErrors")->fReason, "the kernel counts the errors of no PCI Express device");
+  for (char const* name : {"CIM_NumericSensor", "CIM_Fan", "ZEP_MemoryErrors", "CIM_PowerSupply", "ZEP_PCIErrors"})
+    EXPECT_EQ(reasons.WhyNoInstance(name)->fCode, kMissingNoSource) << name << ": no rule about it can be asked";
 }
 
 }  // namespace

@@ -53,9 +53,13 @@ std::string RowWith(std::vector<std::string> const& cells) {
 
 // ---- Findings ----
 
-std::size_t RulesAsked(TStoredReport const& report) {
-  return static_cast<std::size_t>(std::count_if(report.fRules.begin(), report.fRules.end(),
-                                                [](TStoredRule const& rule) { return rule.fOutcome != "not-asked"; }));
+template <class TIs>
+std::size_t CountRules(TStoredReport const& report, TIs const& is) {
+  return static_cast<std::size_t>(std::count_if(report.fRules.begin(), report.fRules.end(), is));
+}
+
+std::size_t RulesNotAsked(TStoredReport const& report) {
+  return CountRules(report, [](TStoredRule const& rule) { return rule.fOutcome == "not-asked"; });
 }
 
 std::string Verdict(TStoredReport const& report) {
@@ -67,7 +71,7 @@ std::string Verdict(TStoredReport const& report) {
     bool const hasPlural = count > 1 && (severity == std::string("error") || severity == std::string("warning"));
     text += (text.empty() ? "" : ", ") + std::to_string(count) + " " + severity + (hasPlural ? "s" : "");
   }
-  bool const isAllAsked = RulesAsked(report) == report.fRules.size();
+  bool const isAllAsked = RulesNotAsked(report) == 0;
   if (text.empty() && isAllAsked) return "<p class=\"verdict fine\">No problem was found</p>\n";
   if (text.empty()) return "<p class=\"verdict\">No problem was found by the rules that could be asked</p>\n";
   return "<p class=\"verdict " + Html(report.fProblems.front().fSeverity) + "\">" + text + "</p>\n";
@@ -80,19 +84,21 @@ std::string Problem(TStoredProblem const& problem) {
   return html + Element("span", "class=\"soft\"", problem.fRule) + "</li>\n";
 }
 
+std::string Answer(TStoredRule const& rule) {
+  if (rule.fHasNothingToExamine) return Element("span", "class=\"none\"", "nothing to examine");
+  if (rule.fOutcome == "fine") return Element("span", "class=\"fine\"", "no");
+  if (rule.fOutcome == "wrong") return Element("span", "class=\"error\"", "yes");
+  if (rule.fNotExamined.empty()) return Element("span", "class=\"none\"", "unknown");
+  return Missing({"", rule.fNotExamined.front()});
+}
+
 std::string Rules(TStoredReport const& report) {
   std::string rows;
-  for (TStoredRule const& rule : report.fRules) {
-    bool const isAsked = rule.fOutcome != "not-asked";
-    std::string const answer = rule.fOutcome == "fine"     ? Element("span", "class=\"fine\"", "no")
-                               : isAsked                   ? Element("span", "class=\"error\"", "yes")
-                               : rule.fNotExamined.empty() ? Element("span", "class=\"none\"", "unknown")
-                                                           : Missing({"", rule.fNotExamined.front()});
-    rows += RowWith({Html(rule.fQuestion), answer});
-  }
-  std::size_t const asked = RulesAsked(report);
-  std::string const summary =
-      std::to_string(asked) + " rules asked, " + std::to_string(report.fRules.size() - asked) + " could not be asked";
+  for (TStoredRule const& rule : report.fRules) rows += RowWith({Html(rule.fQuestion), Answer(rule)});
+  std::size_t const notAsked = RulesNotAsked(report),
+                    idle = CountRules(report, [](TStoredRule const&rule) { return rule.fHasNothingToExamine; });
+  std::string const summary = std::to_string(report.fRules.size() - notAsked - idle) + " rules asked, " + std::to_string(idle) +
+                              " had nothing to examine, " + std::to_string(notAsked) + " could not be asked";
   return "<details>" + Element("summary", summary) + Table("Rules", {"Question", "Answer"}, rows) + "</details>\n";
 }
 

@@ -34,9 +34,11 @@ TJson FindingsAsJson(TFindings const& findings) {
   TJson thresholds = TJson::object();
   for (auto const& [key, value] : findings.fThresholds.Settings()) thresholds[key] = value;
   auto const worst = findings.Worst();
+  auto const [asked, withNothing, notAsked] = findings.CountRules();
   return {{"worst", worst ? TJson(NameOf(*worst)) : TJson(nullptr)},
           {"problems", problems},
           {"rules", rules},
+          {"counts", {{"asked", asked}, {"nothingToExamine", withNothing}, {"notAsked", notAsked}}},
           {"thresholds", thresholds}};
 }
 

@@ -34,9 +34,10 @@ std::string Indented(std::string const& head, std::string const& text) {
 }
 
 std::string AskedText(TFindings const& findings) {
-  std::size_t const notAsked = findings.CountOf(EOutcome::kNotAsked), asked = findings.fRules.size() - notAsked;
+  auto const [asked, withNothing, notAsked] = findings.CountRules();
   return std::to_string(asked) + (asked == 1 ? " rule asked" : " rules asked") +
-         (notAsked == 0 ? "" : ", " + std::to_string(notAsked) + " could not be");
+         (withNothing == 0 ? "" : ", " + std::to_string(withNothing) + " had nothing to examine") +
+         (notAsked == 0 ? "" : ", " + std::to_string(notAsked) + " could not be asked");
 }
 
 // The thresholds that the settings have changed; empty if there are none.
@@ -69,9 +70,9 @@ std::vector<std::string> ReasonsOf(TFindings const& findings) {
 std::string OutcomeText(TRuleResult const& rule) {
   if (rule.fOutcome == EOutcome::kWrong) return "wrong";
   if (rule.fOutcome == EOutcome::kNotAsked) return "not asked: " + rule.fNotAsked.front().fReason;
-  std::string const fine = rule.fExamined == 0 ? "fine: nothing to examine" : "fine";
-  if (rule.fNotAsked.empty()) return fine;
-  return fine + ", but " + std::to_string(rule.fNotAsked.size()) + " not examined: " + rule.fNotAsked.front().fReason;
+  if (rule.HasNothingToExamine()) return "nothing to examine";
+  if (rule.fNotAsked.empty()) return "fine";
+  return "fine, but " + std::to_string(rule.fNotAsked.size()) + " not examined: " + rule.fNotAsked.front().fReason;
 }
 
 }  // namespace

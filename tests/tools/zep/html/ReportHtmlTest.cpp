@@ -63,6 +63,15 @@ TEST(ReportHtmlTest, WithoutProblemsTheRulesThatWereNotAskedAreMentioned) {
   EXPECT_THAT(ReportAsHtml(report), HasSubstr("No problem was found by the rules that could be asked</p>"));
 }
 
+TEST(ReportHtmlTest, RulesWithNothingToExamineAreCountedApart) {
+  std::string const wrong = R"("outcome": "wrong", "examined": 1)";
+  EXPECT_THAT(PageOf(StoredDocument()), HasSubstr("1 rules asked, 0 had nothing to examine, 0 could not be asked"));
+  std::string const idle = PageOf(StoredDocumentWith(wrong, R"("outcome": "fine", "examined": 0)"));
+  EXPECT_THAT(idle, HasSubstr("0 rules asked, 1 had nothing to examine, 0 could not be asked"));
+  EXPECT_THAT(idle, HasSubstr("nothing to examine</span>"));
+  EXPECT_THAT(PageOf(StoredDocumentWith(wrong, R"("outcome": "fine", "examined": 1)")), HasSubstr("\"fine\">no</span>"));
+}
+
 TEST(ReportHtmlTest, MarkupInEveryTextOfTheDocumentIsShownAsText) {
   std::string const hostile = "<b onload=\\\"x\\\">";
   for (char const* text : {"\"db1\"", "db1: Server Q100", "sda is failing", "Replace it.", "needs root", "Memory modules", "Slot",

@@ -132,6 +132,26 @@ TEST_F(FindingsTextTest, EveryRuleHasAnAnswerAndEveryUnansweredOneAReason) {
   EXPECT_EQ(findings["thresholds"]["finding-file-system-free-percent"], 10);
 }
 
+TEST_F(FindingsTextTest, RulesWithNothingToExamineAndWithoutASourceAreCountedApart) {
+  TTempDir const root;  // a machine that has nothing
+  nlohmann::json const findings = JsonOf(fInstalled->Run({{"report", "--json"}, {{"ZEP_ROOT", root.Path()}}}))["findings"];
+  std::map<std::string, int> counted;
+  for (nlohmann::json const& rule : findings["rules"]) {
+    bool const isIdle = rule["outcome"] == "fine" && rule["examined"] == 0;
+    ++counted[rule["outcome"] == "not-asked" ? "notAsked" : isIdle ? "nothingToExamine" : "asked"];
+  }
+  for (char const* name : {"asked", "nothingToExamine", "notAsked"}) EXPECT_EQ(findings["counts"][name], counted[name]) << name;
+  std::vector<std::string> withoutSource;
+  for (nlohmann::json const& rule : findings["rules"])
+    for (std::string const each : {"sensor-threshold", "fan-stopped", "power-supply-lost", "memory-errors", "pci-errors",
+                                   "pci-link", "processor-weakness"})
+      if (rule["id"] == each && rule["outcome"] == "not-asked") withoutSource.push_back(each);
+  EXPECT_EQ(withoutSource.size(), 7u);
+
+  std::string const text = fInstalled->Run({{"report"}, {{"ZEP_ROOT", root.Path()}}}).fOutput;
+  EXPECT_THAT(text, HasSubstr(std::to_string(counted["nothingToExamine"]) + " had nothing to"));
+}
+
 TEST_F(FindingsTextTest, TheTextBeginsWithTheProblemsAndTheirRemedies) {
   std::string const text = Report("degraded").fOutput;
   EXPECT_THAT(text, HasSubstr("\n\nFindings: 1 critical, 2 errors, 1 warning ("));
