@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// A provider plug-in that states the source of each value, and the reason for each missing one.
+// A provider plug-in that states the source of each value, and the reason for each missing one. It also reports a problem: a
+// battery that is nearly empty.
 
 #include "TMemoryNamespace.h"
 #include "TMemoryProvider.h"
@@ -39,21 +40,43 @@ TFinding<unsigned short> PercentFrom(std::string const& text) {
   return static_cast<unsigned short>(percent);
 }
 
+TFinding<unsigned short> ChargeOf(std::filesystem::path const& battery) {
+  return ReadLine(battery / "capacity").Then(PercentFrom);
+}
+
 TRecord BatteryRecord(std::filesystem::path const& battery) {
   TRecord record("X_Battery", "sysfs");
   record.AddKey("Name", battery.filename().string());
   record.Add("Model", ReadLine(battery / "model_name"));
-  record.Add("Charge", ReadLine(battery / "capacity").Then(PercentFrom));
+  record.Add("Charge", ChargeOf(battery));
+  return record;
+}
+
+// A problem of the battery, which zep report lists among its findings.
+TRecord FindingRecord(std::string const& battery, unsigned short charge) {
+  TRecord record("ZEP_Finding", "sysfs", "CIM_ManagedElement");
+  record.AddKey("InstanceID", "battery-charge " + battery);
+  record.AddOwn("Rule", "battery-charge");
+  record.AddOwn("Severity", "warning");
+  record.Add("Reason", TFinding<std::string>("the battery " + battery + " has only " + std::to_string(charge) + " % left"));
+  record.AddOwn("Remedy", "Connect the machine to its power supply, and check that the battery charges.");
+  record.AddOwn("Element", "X_Battery.Name=\"" + battery + "\"");
   return record;
 }
 
 void FillNamespace(TMemoryNamespace& ns) {
-  std::vector<TRecord> records;
+  constexpr unsigned short lowest = 20;  // percent
+  std::vector<TRecord> records, findings;
   std::error_code ignored;
-  for (auto const& entry : std::filesystem::directory_iterator(Directory(), ignored)) records.push_back(BatteryRecord(entry));
+  for (auto const& entry : std::filesystem::directory_iterator(Directory(), ignored)) {
+    records.push_back(BatteryRecord(entry));
+    auto const charge = ChargeOf(entry);
+    if (charge && *charge < lowest) findings.push_back(FindingRecord(entry.path().filename().string(), *charge));
+  }
 
   TRecordWriter writer(ns);
   writer.Write(BatteryRecord(""), records, TMissing{kMissingNotGiven, "the kernel shows no battery"});
+  writer.Write(FindingRecord("", 0), findings, TMissing{kMissingNotApplicable, "no battery is nearly empty"});
   writer.WriteMissing();
 }
 

@@ -132,6 +132,28 @@ TEST_F(FindingsTextTest, EveryRuleHasAnAnswerAndEveryUnansweredOneAReason) {
   EXPECT_EQ(findings["thresholds"]["finding-file-system-free-percent"], 10);
 }
 
+TEST_F(FindingsTextTest, AProblemThatAPlugInReportsIsFoundAndGone) {
+  TTempDir const batteries;
+  fs::create_directory(batteries.Path("BAT0"));
+  TEnvironmentGuard const directory("EXAMPLE_BATTERIES", batteries.Path().c_str());
+  auto const problemsAt = [&](char const* charge) {
+    WriteFile(batteries.Path("BAT0/capacity"), charge);
+    TRun const run = Report("server", {"--json", "--fail-on", "warning", "--plugin", BATTERIES_PLUGIN});
+    auto const problems = JsonOf(run)["findings"]["problems"];
+    EXPECT_EQ(run.fStatus == 3, !problems.empty());
+    return problems;
+  };
+  auto const problems = problemsAt("19\n");
+  ASSERT_EQ(problems.size(), 1U);
+  EXPECT_EQ(problems[0]["rule"], "battery-charge");
+  EXPECT_EQ(problems[0]["severity"], "warning");
+  EXPECT_EQ(problems[0]["reason"], "the battery BAT0 has only 19 % left");
+  EXPECT_EQ(problems[0]["remedy"], "Connect the machine to its power supply, and check that the battery charges.");
+  EXPECT_EQ(problems[0]["instance"], "X_Battery.Name=\"BAT0\"");
+  EXPECT_EQ(problems[0]["source"], "sysfs");
+  EXPECT_THAT(problemsAt("20\n"), IsEmpty());
+}
+
 TEST_F(FindingsTextTest, RulesWithNothingToExamineAndWithoutASourceAreCountedApart) {
   TTempDir const root;  // a machine that has nothing
   nlohmann::json const findings = JsonOf(fInstalled->Run({{"report", "--json"}, {{"ZEP_ROOT", root.Path()}}}))["findings"];
