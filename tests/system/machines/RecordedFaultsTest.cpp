@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 
 // Every fault that files of the kernel or answers of programs and controllers can show: planted in a recorded machine, it is
-// found with its rule alone, and it is gone when mended.
+// found with its rule alone, and it is gone when mended. Before and after, the rule examines the healthy values.
 
 #include "tests/Machines.h"
 #include "tests/providers/controller/ControllerBytes.h"
@@ -10,17 +10,19 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <cstring>
 #include <functional>
 #include <regex>
+#include <set>
 
 namespace NQRVZEP20::zep {
 namespace {
 
-using testing::Each;
+using testing::HasSubstr;
 using testing::IsEmpty;
 using testing::Not;
 
-// Returns the content of a file with the fault. A file that does not exist is empty, and is removed when the fault is mended.
+// Returns the content of a file with the fault.
 using TFault = std::function<std::string(std::string const& content)>;
 
 TFault Content(std::string const& content) {
@@ -41,61 +43,8 @@ TFault Patched(std::size_t offset, std::string const& bytes) {
 
 struct TRow {
   char const* fProblem;  // severity and rule
+  char const* fRemedy;   // a part of it
   std::vector<std::pair<std::string, TFault>> fChanges;
-};
-
-class RecordedFaultsTest : public testing::Test {
-protected:
-  RecordedFaultsTest() {
-    for (char const* library :
-         {"libDevices.nsp.so", "libNetwork.nsp.so", "libStorage.nsp.so", "libSensors.nsp.so", "libController.nsp.so"})
-      fInstalled.Add(library, std::string(TEST_LIB_DIR "/") + library);
-  }
-
-  // The problems as "severity rule".
-  std::vector<std::string> Problems() const {
-    TCall call{{"report", "--json", "--plugin-timeout", "60"}, {{"ZEP_ROOT", fMachine.Root()}}};
-    call.fOutputFile = fInstalled.Path("document");
-    fInstalled.Run(call);
-    std::vector<std::string> problems;
-    nlohmann::json const document = nlohmann::json::parse(ReadFile(call.fOutputFile));
-    for (nlohmann::json const& problem : document["findings"]["problems"]) {
-      EXPECT_FALSE(problem["remedy"].get<std::string>().empty()) << problem;
-      problems.push_back(problem["severity"].get<std::string>() + " " + problem["rule"].get<std::string>());
-    }
-    return problems;
-  }
-
-  std::string Path(std::string const& path) const { return fMachine.Root() + "/" + path; }
-
-  // Each fault is mended before the next is planted, so that its problem would be found beside that of the next.
-  template <std::size_t N>
-  void ExpectFoundAndGone(TRow const (&rows)[N]) const {
-    for (TRow const& row : rows) ExpectFound(row);
-    EXPECT_THAT(Problems(), IsEmpty()) << "all are mended";
-  }
-
-  void ExpectFound(TRow const& row) const {
-    SCOPED_TRACE(row.fProblem);
-    std::map<std::string, std::string> healthy;
-    std::vector<std::string> added;
-    for (auto const& [path, fault] : row.fChanges) {
-      bool const isThere = fs::exists(Path(path));
-      if (isThere)
-        healthy[path] = ReadFile(Path(path));
-      else
-        added.push_back(path), fs::create_directories(fs::path(Path(path)).parent_path());
-      WriteFile(Path(path), fault(isThere ? healthy[path] : ""));
-    }
-    auto const problems = Problems();
-    EXPECT_THAT(problems, Not(IsEmpty()));
-    EXPECT_THAT(problems, Each(row.fProblem));
-    for (auto const& [path, content] : healthy) WriteFile(Path(path), content);
-    for (std::string const& path : added) fs::remove(Path(path));
-  }
-
-  TInstallation fInstalled;
-  TRecordedMachine fMachine{"server"};
 };
 
 std::string const kPort = "sys/devices/pci0000:00/0000:00:03.0/", kCard = kPort + "0000:01:00.0/";
@@ -103,9 +52,92 @@ std::string const kDisk = kCard + "0000:02:00.0/0000:03:00.0/", kSensor = kDisk 
 std::string const kEthernet = kCard + "0000:02:01.0/0000:04:00.0/net/eth1/";
 std::string const kSupply = "sys/class/power_supply/", kModules = "sys/devices/system/edac/mc/mc0/";
 std::string const kAnswers = "zep-answers/", kIpmi = kAnswers + "ipmi/";
+constexpr std::size_t kClockStatus = 40;  // in the structure of adjtimex
+
+class RecordedFaultsTest : public testing::Test {
+protected:
+  RecordedFaultsTest() {
+    for (char const* library :
+         {"libDevices.nsp.so", "libNetwork.nsp.so", "libStorage.nsp.so", "libSensors.nsp.so", "libController.nsp.so"})
+      fInstalled.Add(library, std::string(TEST_LIB_DIR "/") + library);
+    MakeHealthy();
+  }
+
+  // The recorded machine has no errors to count, no fan, power supply or time service, and it has just started.
+  void MakeHealthy() const {
+    for (char const* supply : {"PSU1/", "PSU2/"}) {
+      Write(kSupply + supply + "type", "Mains\n");
+      Write(kSupply + supply + "online", "1\n");
+    }
+    Write(kSensor + "fan1_input", "900\n");
+    Write(kSensor + "fan1_min", "500\n");
+    Write(kModules + "dimm0/dimm_label", "DIMM_A1\n");
+    for (char const* count : {"ce", "ue"}) Write(kModules + "dimm0/dimm_" + count + "_count", "0\n");
+    Write("dev/kmsg", ReadFile(TestDataPath("kmsg/healthy")));
+    Write("proc/uptime", "7200.00 1.00\n");
+    Write(kAnswers + "systemctl/failed", "[]\n");
+    Write(kAnswers + "adjtimex", Patched(kClockStatus, Bytes({0}))(ReadFile(Path(kAnswers + "adjtimex"))));
+  }
+
+  nlohmann::json Findings(std::vector<std::string> const& options = {}) const {
+    TCall call{{"report", "--json", "--plugin-timeout", "60"}, {{"ZEP_ROOT", fMachine.Root()}}};
+    call.fArguments.insert(call.fArguments.end(), options.begin(), options.end());
+    call.fOutputFile = fInstalled.Path("document");
+    fInstalled.Run(call);
+    return nlohmann::json::parse(ReadFile(call.fOutputFile))["findings"];
+  }
+
+  std::string Path(std::string const& path) const { return fMachine.Root() + "/" + path; }
+
+  void Write(std::string const& path, std::string const& content) const {
+    fs::create_directories(fs::path(Path(path)).parent_path());
+    WriteFile(Path(path), content);
+  }
+
+  // Each fault is mended before the next is planted, so that its problem would be found beside that of the next.
+  template <std::size_t N>
+  void ExpectFoundAndGone(TRow const (&rows)[N]) const {
+    ExpectFine(rows);
+    for (TRow const& row : rows) ExpectFound(row);
+    ExpectFine(rows);
+  }
+
+  // Without a fault, the rules of the rows have examined something, and found nothing.
+  template <std::size_t N>
+  void ExpectFine(TRow const (&rows)[N]) const {
+    nlohmann::json const findings = Findings();
+    EXPECT_THAT(findings["problems"], IsEmpty()) << findings["problems"];
+    std::set<std::string> fine;
+    for (nlohmann::json const& rule : findings["rules"])
+      if (rule["outcome"] == "fine" && rule["examined"] > 0) fine.insert(rule["id"]);
+    for (TRow const& row : rows) EXPECT_EQ(fine.count(std::strchr(row.fProblem, ' ') + 1), 1U) << row.fProblem;
+  }
+
+  void ExpectFound(TRow const& row) const {
+    SCOPED_TRACE(row.fProblem);
+    std::map<std::string, std::string> healthy;
+    for (auto const& [path, fault] : row.fChanges) {
+      ASSERT_TRUE(fs::exists(Path(path))) << path;
+      healthy[path] = ReadFile(Path(path));
+      WriteFile(Path(path), fault(healthy[path]));
+    }
+    ExpectProblems(row, Findings()["problems"]);
+    for (auto const& [path, content] : healthy) WriteFile(Path(path), content);
+  }
+
+  static void ExpectProblems(TRow const& row, nlohmann::json const& problems) {
+    EXPECT_THAT(problems, Not(IsEmpty()));
+    for (nlohmann::json const& problem : problems) {
+      EXPECT_EQ(problem["severity"].get<std::string>() + " " + problem["rule"].get<std::string>(), row.fProblem);
+      EXPECT_THAT(problem["remedy"].get<std::string>(), HasSubstr(row.fRemedy));
+    }
+  }
+
+  TInstallation fInstalled;
+  TRecordedMachine fMachine{"server"};
+};
 
 TEST_F(RecordedFaultsTest, OfDisksAndFileSystems) {
-  ASSERT_THAT(Problems(), IsEmpty());
   std::string const spare = R"("available_spare":0,"available_spare_threshold":0)";
   TFault const reallocated = [](std::string report) {
     std::string const none = R"("raw":{"value":0,)";
@@ -113,19 +145,28 @@ TEST_F(RecordedFaultsTest, OfDisksAndFileSystems) {
   };
   TRow const rows[] = {
       {"critical disk-failing",
+       "replace it",
        {{kAnswers + "smartctl/sda", Replaced(R"("smart_status":{"passed":true)", R"("smart_status":{"passed":false)")}}},
-      {"error disk-lost", {{"sys/class/block/sda/device/state", Content("offline\n")}}},
-      {"warning disk-worn", {{kAnswers + "smartctl/nvme0n1", Replaced(R"("percentage_used":0)", R"("percentage_used":95)")}}},
+      {"error disk-lost", "cable", {{"sys/class/block/sda/device/state", Content("offline\n")}}},
+      {"warning disk-worn",
+       "Plan its replacement",
+       {{kAnswers + "smartctl/nvme0n1", Replaced(R"("percentage_used":0)", R"("percentage_used":95)")}}},
       {"error disk-worn",
+       "replace it",
        {{kAnswers + "smartctl/nvme0n1", Replaced(spare, R"("available_spare":3,"available_spare_threshold":10)")}}},
-      {"warning disk-sectors", {{kAnswers + "smartctl/sda", reallocated}}},
+      {"warning disk-sectors", "if it grows", {{kAnswers + "smartctl/sda", reallocated}}},
       {"critical array-degraded",
+       "mdadm --add",
        {{"sys/block/md0/md/degraded", Content("1\n")},
         {"sys/block/md0/md/dev-vda1/state", Content("faulty\n")},
         {"sys/block/md0/md/dev-vda1/slot", Content("none\n")}}},
-      {"error file-system-full", {{kAnswers + "statvfs/data/values", Content("1024 1024 89361 60 50 25376 25364 255\n")}}},
-      {"error file-system-inodes", {{kAnswers + "statvfs/data/values", Content("1024 1024 89361 68867 61772 25376 0 255\n")}}},
-      {"error file-system-read-only", {{"proc/self/mountinfo", Replaced("ext4 /dev/md0 rw", "ext4 /dev/md0 ro")}}},
+      {"error file-system-full",
+       "enlarge",
+       {{kAnswers + "statvfs/data/values", Content("1024 1024 89361 60 50 25376 25364 255\n")}}},
+      {"error file-system-inodes",
+       "many small ones",
+       {{kAnswers + "statvfs/data/values", Content("1024 1024 89361 68867 61772 25376 0 255\n")}}},
+      {"error file-system-read-only", "fsck", {{"proc/self/mountinfo", Replaced("ext4 /dev/md0 rw", "ext4 /dev/md0 ro")}}},
   };
   ExpectFoundAndGone(rows);
 }
@@ -135,13 +176,15 @@ TEST_F(RecordedFaultsTest, OfPortsAndLinks) {
   std::string const settings = kAnswers + "ethtool/eth1/linksettings";
   std::string const width8 = "8\n", rate8 = "8.0 GT/s PCIe\n", rate2 = "2.5 GT/s PCIe\n";
   TRow const rows[] = {
-      {"warning port-slow", {{settings, Patched(speed, Bytes({100, 0, 0, 0}))}}},
-      {"warning port-half-duplex", {{settings, Patched(duplex, Bytes({0}))}}},
-      {"error bond-member", {{kEthernet + "bonding_slave/mii_status", Content("down\n")}}},
-      {"warning pci-link", {{kCard + "max_link_width", Content(width8)}, {kCard + "current_link_width", Content("4\n")}}},
-      {"warning pci-link", {{kCard + "max_link_speed", Content(rate8)}, {kCard + "current_link_speed", Content(rate2)}}},
-      {"error pci-errors", {{kPort + "aer_dev_fatal", Replaced("TOTAL_ERR_FATAL 0", "TOTAL_ERR_FATAL 1")}}},
-      {"warning pci-errors", {{kPort + "aer_dev_correctable", Replaced("TOTAL_ERR_COR 0", "TOTAL_ERR_COR 1001")}}},
+      {"warning port-slow", "cable", {{settings, Patched(speed, Bytes({100, 0, 0, 0}))}}},
+      {"warning port-half-duplex", "negotiate", {{settings, Patched(duplex, Bytes({0}))}}},
+      {"error bond-member", "cable", {{kEthernet + "bonding_slave/mii_status", Content("down\n")}}},
+      {"warning pci-link",
+       "riser",
+       {{kCard + "max_link_width", Content(width8)}, {kCard + "current_link_width", Content("4\n")}}},
+      {"warning pci-link", "riser", {{kCard + "max_link_speed", Content(rate8)}, {kCard + "current_link_speed", Content(rate2)}}},
+      {"error pci-errors", "riser", {{kPort + "aer_dev_fatal", Replaced("TOTAL_ERR_FATAL 0", "TOTAL_ERR_FATAL 1")}}},
+      {"warning pci-errors", "riser", {{kPort + "aer_dev_correctable", Replaced("TOTAL_ERR_COR 0", "TOTAL_ERR_COR 1001")}}},
   };
   ExpectFoundAndGone(rows);
 }
@@ -155,32 +198,22 @@ TEST_F(RecordedFaultsTest, OfPortsOfABridge) {
     fs::remove(master);
     fs::create_symlink("/sys/devices/virtual/net/br0", master);
   }
-  ASSERT_THAT(Problems(), IsEmpty());
   TRow const rows[] = {
       {"warning port-errors",
+       "cable",
        {{kEthernet + "statistics/rx_packets", Content("100000\n")}, {kEthernet + "statistics/rx_errors", Content("10\n")}}},
-      {"error port-unplugged", {{kEthernet + "operstate", Content("down\n")}, {kEthernet + "carrier", Content("0\n")}}}};
+      {"error port-unplugged", "cable", {{kEthernet + "operstate", Content("down\n")}, {kEthernet + "carrier", Content("0\n")}}}};
   ExpectFoundAndGone(rows);
 }
 
 TEST_F(RecordedFaultsTest, OfSensorsAndMemory) {
   TRow const rows[] = {
-      {"error sensor-threshold", {{kSensor + "temp1_input", Content("100850\n")}}},
-      {"warning sensor-threshold", {{kSensor + "temp1_input", Content("75850\n")}}},
-      {"error fan-stopped", {{kSensor + "fan1_input", Content("0\n")}, {kSensor + "fan1_min", Content("500\n")}}},
-      {"error power-supply-lost",
-       {{kSupply + "PSU1/type", Content("Mains\n")},
-        {kSupply + "PSU1/online", Content("1\n")},
-        {kSupply + "PSU2/type", Content("Mains\n")},
-        {kSupply + "PSU2/online", Content("0\n")}}},
-      {"critical memory-errors",
-       {{kModules + "dimm0/dimm_label", Content("DIMM_A1\n")},
-        {kModules + "dimm0/dimm_ce_count", Content("0\n")},
-        {kModules + "dimm0/dimm_ue_count", Content("1\n")}}},
-      {"warning memory-errors",
-       {{kModules + "dimm0/dimm_label", Content("DIMM_A1\n")},
-        {kModules + "dimm0/dimm_ce_count", Content("101\n")},
-        {kModules + "dimm0/dimm_ue_count", Content("0\n")}}},
+      {"error sensor-threshold", "air flow", {{kSensor + "temp1_input", Content("100850\n")}}},
+      {"warning sensor-threshold", "air flow", {{kSensor + "temp1_input", Content("75850\n")}}},
+      {"error fan-stopped", "Replace the fan", {{kSensor + "fan1_input", Content("0\n")}}},
+      {"error power-supply-lost", "cable", {{kSupply + "PSU2/online", Content("0\n")}}},
+      {"critical memory-errors", "Replace the memory module", {{kModules + "dimm0/dimm_ue_count", Content("1\n")}}},
+      {"warning memory-errors", "Watch the number", {{kModules + "dimm0/dimm_ce_count", Content("101\n")}}},
   };
   ExpectFoundAndGone(rows);
 }
@@ -202,16 +235,21 @@ TEST_F(RecordedFaultsTest, OfTheSystem) {
     return text.substr(0, second) + std::regex_replace(text.substr(second), std::regex("0x1000065"), "0x1000064");
   };
   TRow const rows[] = {
-      {"warning processors-differ", {{"proc/cpuinfo", secondProcessor}}},
-      {"warning memory-differs", {{"sys/firmware/dmi/tables/DMI", WithSmallerModule}}},
-      {"information processor-weakness", {{"sys/devices/system/cpu/vulnerabilities/meltdown", Content("Vulnerable\n")}}},
-      {"warning clock-synchronized", {{"proc/uptime", Content("7200.00 1.00\n")}}},
-      {"error kernel-taint", {{"proc/sys/kernel/tainted", Content("128\n")}}},
-      {"warning failed-units", {{kAnswers + "systemctl/failed", Content(unit)}}},
+      {"warning processors-differ", "microcode", {{"proc/cpuinfo", secondProcessor}}},
+      {"warning memory-differs", "same size", {{"sys/firmware/dmi/tables/DMI", WithSmallerModule}}},
+      {"information processor-weakness",
+       "Update the kernel",
+       {{"sys/devices/system/cpu/vulnerabilities/meltdown", Content("Vulnerable\n")}}},
+      {"warning clock-synchronized", "time service", {{kAnswers + "adjtimex", Patched(kClockStatus, Bytes({0x40}))}}},
+      {"error kernel-taint", "journalctl -k", {{"proc/sys/kernel/tainted", Content("128\n")}}},
+      {"warning failed-units", "systemctl status", {{kAnswers + "systemctl/failed", Content(unit)}}},
       {"warning out-of-memory",
+       "MemoryMax",
        {{"dev/kmsg", Content("3,1,1000000,-;Memory cgroup out of memory: Killed process 158 (tail) total-vm:7048kB\n")}}},
-      {"error hardware-errors", {{"dev/kmsg", Content("2,1,1000000,-;{1}[Hardware Error]: event severity: fatal\n")}}},
-      {"error disk-errors", {{"dev/kmsg", Content("3,1,1000000,-;I/O error, dev sda, sector 8 op 0x1:(WRITE)\n")}}},
+      {"error hardware-errors",
+       "management controller",
+       {{"dev/kmsg", Content("2,1,1000000,-;{1}[Hardware Error]: event severity: fatal\n")}}},
+      {"error disk-errors", "smartctl", {{"dev/kmsg", Content("3,1,1000000,-;I/O error, dev sda, sector 8 op 0x1:(WRITE)\n")}}},
   };
   ExpectFoundAndGone(rows);
 }
@@ -230,18 +268,32 @@ TEST_F(RecordedFaultsTest, OfTheManagementController) {
   WriteFile(Path(kIpmi + "0644-0102"), Bytes({0, 2, 0x42, 0, 0x14}));
   WriteFile(Path(kIpmi + "0646-01"), Bytes({0}) + std::string(16, '\0'));
   WriteFile(Path(kIpmi + "0646-02"), Bytes({0}) + "support" + std::string(9, '\0'));
-  ASSERT_THAT(Problems(), IsEmpty());
   TRow const rows[] = {
-      {"error sensor-threshold", {{kIpmi + "042d-01", Content(Bytes({0, 91, 0xC0, 0x18}))}}},
-      {"error fan-stopped", {{kIpmi + "042d-02", Content(Bytes({0, 0, 0xC0, 0x07}))}}},
-      {"error controller-part-failed", {{kIpmi + "042d-03", Content(Bytes({0, 0, 0xC0, 3, 0}))}}},
-      {"error event-log-critical", {{kIpmi + "0a40-", Content(info)}}},
-      {"warning event-log-full", {{kIpmi + "0a40-", Patched(4, Bytes({0, 0}))}}},
-      {"warning controller-clock", {{kIpmi + "0a48-", Content(Bytes({0, 9, 0, 0, 0}))}}},
-      {"information controller-account", {{kIpmi + "0646-02", Content(Bytes({0}) + "ADMIN" + std::string(11, '\0'))}}},
-      {"warning controller-account", {{kIpmi + "0644-0101", Content(Bytes({0, 2, 0x42, 0, 0x14}))}}},
+      {"error sensor-threshold", "air flow", {{kIpmi + "042d-01", Content(Bytes({0, 91, 0xC0, 0x18}))}}},
+      {"error fan-stopped", "Replace the fan", {{kIpmi + "042d-02", Content(Bytes({0, 0, 0xC0, 0x07}))}}},
+      {"error controller-part-failed", "replace it", {{kIpmi + "042d-03", Content(Bytes({0, 0, 0xC0, 3, 0}))}}},
+      {"error event-log-critical", "ipmitool sel clear", {{kIpmi + "0a40-", Content(info)}}},
+      {"warning event-log-full", "ipmitool sel save", {{kIpmi + "0a40-", Patched(4, Bytes({0, 0}))}}},
+      {"warning controller-clock", "ipmitool sel time set", {{kIpmi + "0a48-", Content(Bytes({0, 9, 0, 0, 0}))}}},
+      {"information controller-account",
+       "ipmitool user set password",
+       {{kIpmi + "0646-02", Content(Bytes({0}) + "ADMIN" + std::string(11, '\0'))}}},
+      {"warning controller-account", "ipmitool user disable", {{kIpmi + "0644-0101", Content(Bytes({0, 2, 0x42, 0, 0x14}))}}},
   };
   ExpectFoundAndGone(rows);
+}
+
+// A plug-in reports problems only, so that the rule has nothing to examine without one.
+TEST_F(RecordedFaultsTest, OfAPlugIn) {
+  Write("batteries/BAT0/capacity", "97\n");
+  TEnvironmentGuard const directory("EXAMPLE_BATTERIES", Path("batteries").c_str());
+  std::vector<std::string> const options = {"--plugin", BATTERIES_PLUGIN};
+  auto const problems = [&] { return Findings(options)["problems"]; };
+  EXPECT_THAT(problems(), IsEmpty());
+  Write("batteries/BAT0/capacity", "12\n");
+  ExpectProblems({"warning battery-charge", "power supply", {}}, problems());
+  Write("batteries/BAT0/capacity", "97\n");
+  EXPECT_THAT(problems(), IsEmpty());
 }
 
 }  // namespace
