@@ -2,6 +2,7 @@
 #include "collect/Sample.h"
 
 #include <cstdlib>
+#include <new>
 
 namespace NQRVZEP20 {
 
@@ -12,12 +13,17 @@ constexpr char const* kNameVariable = "ZEP_HOST_NAME";
 constexpr char const* kSampleVariable = "ZEP_SAMPLE";
 constexpr char const* kFromFile = " (file)";  // how the host provider marks values that it reads from a table file
 
+// Throws when there is no memory for it: without the variable, the providers would describe this machine.
+void Set(char const* variable, std::string const& value) {
+  if (::setenv(variable, value.c_str(), 1) != 0) throw std::bad_alloc();
+}
+
 }  // namespace
 
 void SetForProviders(TSample const& sample) {
-  ::setenv(kTableVariable, sample.fTableFile.c_str(), 1);
-  ::setenv(kNameVariable, sample.fHostName.c_str(), 1);
-  ::setenv(kSampleVariable, sample.fLabel.c_str(), 1);
+  Set(kTableVariable, sample.fTableFile);
+  Set(kNameVariable, sample.fHostName);
+  Set(kSampleVariable, sample.fLabel);
 }
 
 std::string NamedTableFile() {

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Makes every call that a host service makes to the C library fail, one after the other (tests/os/faults). The operation must
+// Makes every call that a host service makes to the C library fail, one after the other (tests/faults). The operation must
 // report the correct result, leak nothing, and end.
 
 #include "tests/os/HostTools.h"

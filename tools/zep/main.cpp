@@ -8,6 +8,7 @@
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/Text.h"
+#include "tools/zep/processes/WriteWhole.h"
 #include "tools/zep/secrets/Password.h"
 #include "tools/zep/secrets/Secrets.h"
 
@@ -21,6 +22,7 @@
 #include <exception>
 #include <iostream>
 #include <map>
+#include <new>
 #include <sstream>
 #include <string>
 #include <vector>
@@ -224,10 +226,14 @@ std::string NameOfDocument(CLI::App const& app, std::vector<std::string> const& 
 }
 
 // Prints no second document when one was printed, even in part.
-void WriteFailure(std::string const& document, std::exception const& failure) {
+void WriteFailure(std::string const& document, EExitStatus status, std::string const& reason) {
   if (HasWrittenOutput()) return;
-  std::string const why = FailureOf([&] { WriteOutput(FailureAsJson(document, StatusOf(failure), failure.what())); });
+  std::string const why = FailureOf([&] { WriteOutput(FailureAsJson(document, status, reason)); });
   if (!why.empty()) std::cerr << "zep: " << Printable(why) << '\n';
+}
+
+std::string WhyOf(std::exception const& failure) {
+  return dynamic_cast<std::bad_alloc const*>(&failure) != nullptr ? "not enough memory" : failure.what();
 }
 
 // Signal settings are inherited. From a caller that ignores SIGCHLD, as some services do, zep could not get the exit status of
@@ -247,8 +253,9 @@ int RunOrFail(std::vector<std::string> const& words) {
   try {
     return Run(app, runs, words);
   } catch (std::exception const& failure) {
-    std::cerr << "zep: " << Printable(failure.what()) << '\n';
-    if (IsJsonWanted(words)) WriteFailure(NameOfDocument(app, words), failure);
+    std::string const why = WhyOf(failure);
+    std::cerr << "zep: " << Printable(why) << '\n';
+    if (IsJsonWanted(words)) WriteFailure(NameOfDocument(app, words), StatusOf(failure), why);
     return StatusOf(failure);
   }
 }
@@ -261,14 +268,32 @@ void FillStandardDescriptors() {
   if (fd > STDERR_FILENO) ::close(fd);
 }
 
+// Without this, zep would end with a core dump where an exception cannot be caught: there is no memory for the message, or a
+// destructor of the JSON library needs some.
+void SetEndWithoutMemory() {
+  static pid_t const process = ::getpid();  // a plug-in, which runs in a child, ends as it does in any other program
+  static std::terminate_handler const usual = std::set_terminate([] {
+    try {
+      if (::getpid() == process && std::current_exception()) std::rethrow_exception(std::current_exception());
+    } catch (std::bad_alloc const&) {
+      WriteWhole(STDERR_FILENO, "zep: not enough memory\n");
+      ::_exit(kExitNothing);
+    } catch (...) {
+    }
+    usual();
+  });
+}
+
 }  // namespace
 
 }  // namespace NQRVZEP20::zep
 
 int main(int argc, char** argv) {
-  NQRVZEP20::zep::FillStandardDescriptors();
-  NQRVZEP20::zep::SetSignals();
+  using namespace NQRVZEP20::zep;
+  SetEndWithoutMemory();
+  FillStandardDescriptors();
+  SetSignals();
   std::vector<std::string> const words(argv + 1, argv + argc);
-  NQRVZEP20::zep::KeepSecrets(words);
-  return NQRVZEP20::zep::RunOrFail(words);
+  KeepSecrets(words);
+  return RunOrFail(words);
 }

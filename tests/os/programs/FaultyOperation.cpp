@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Runs one operation of the host services while the preloaded tests/os/faults makes one of its calls fail. Prints the result, the
+// Runs one operation of the host services while the preloaded tests/faults makes one of its calls fail. Prints the result, the
 // log entries, and the resources that are left.
 //
 //   FaultyOperation OPERATION       in a directory of files that the test prepared

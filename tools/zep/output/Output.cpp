@@ -17,6 +17,11 @@ namespace {
 
 bool gHasWrittenOutput = false;
 
+// Repeats what a signal interrupts: otherwise the document would go to standard error.
+void Redirect(int from, int to) {
+  while (::dup2(from, to) < 0 && (errno == EINTR || errno == EBUSY)) continue;
+}
+
 }  // namespace
 
 void WriteOutput(std::string const& text) {
@@ -30,13 +35,13 @@ void WriteMessage(std::string const& text) { WriteOutput(MessageWithoutSecrets(t
 bool HasWrittenOutput() { return gHasWrittenOutput; }
 
 TOutputGuard::TOutputGuard() : fOutput(::dup(STDOUT_FILENO)) {
-  if (fOutput) ::dup2(STDERR_FILENO, STDOUT_FILENO);
+  if (fOutput) Redirect(STDERR_FILENO, STDOUT_FILENO);
 }
 
 TOutputGuard::~TOutputGuard() {
   std::cout.flush();
   std::fflush(stdout);
-  if (fOutput) ::dup2(fOutput.get(), STDOUT_FILENO);
+  if (fOutput) Redirect(fOutput.get(), STDOUT_FILENO);
 }
 
 }  // namespace NQRVZEP20::zep
