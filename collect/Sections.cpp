@@ -94,8 +94,9 @@ TCell DescribedCell(TNamespaceView const& view, ICIMInstance const& instance, st
   return description.IsKnown() ? description : cell;
 }
 
-// "525400112201" as "52:54:00:11:22:01".
+// "525400112201" as "52:54:00:11:22:01". An address that has separators stays as it is.
 std::string InPairs(std::string const& address) {
+  if (address.find_first_not_of("0123456789abcdefABCDEF") != std::string::npos) return address;
   std::string digits = address;
   for (std::size_t at = 2; at < digits.size(); at += 3) digits.insert(at, ":");
   return digits;

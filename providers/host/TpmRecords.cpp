@@ -4,6 +4,8 @@
 #include "SmbiosFields.h"
 #include "TCIMSchemaHelper.h"
 
+#include <algorithm>
+
 namespace NQRVZEP20 {
 
 namespace {

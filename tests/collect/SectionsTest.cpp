@@ -85,16 +85,20 @@ TEST_F(SectionsTest, TheRunningSystemHasItsUptimeInDays) {
 }
 
 TEST_F(SectionsTest, AnInterfaceHasItsAddressInPairsAndItsMTUAsANumber) {
-  TRecord record("ZEP_NetworkInterface", "rtnetlink", "CIM_LANEndpoint");
-  record.AddKey("Name", "bond0.10");
-  record.Add("Kind", TFinding<std::string>("vlan"));
-  record.Add("MACAddress", TFinding<std::string>("525400112201"));
-  record.Add("MTU", TFinding<unsigned>(1500)).Unit("byte");
-  record.Add("MasterInterface", TFinding<std::string>("br0"));
-  record.Add("OperationalState", TFinding<std::string>("up"));
-  fWriter.Write(record);
+  auto const interface = [](char const* name, char const* address) {
+    TRecord record("ZEP_NetworkInterface", "rtnetlink", "CIM_LANEndpoint");
+    record.AddKey("Name", name);
+    record.Add("Kind", TFinding<std::string>("vlan"));
+    record.Add("MACAddress", TFinding<std::string>(address));
+    record.Add("MTU", TFinding<unsigned>(1500)).Unit("byte");
+    record.Add("MasterInterface", TFinding<std::string>("br0"));
+    record.Add("OperationalState", TFinding<std::string>("up"));
+    return record;
+  };
+  fWriter.Write(interface("", ""), {interface("bond0.10", "525400112201"), interface("bond0.11", "52:54:00:11:22:02")}, {});
   fWriter.WriteMissing();
-  EXPECT_THAT(Rows("interfaces"), ElementsAre("bond0.10|vlan|52:54:00:11:22:01|1500|br0|up"));
+  EXPECT_THAT(Rows("interfaces"),
+              ElementsAre("bond0.10|vlan|52:54:00:11:22:01|1500|br0|up", "bond0.11|vlan|52:54:00:11:22:02|1500|br0|up"));
 }
 
 TEST_F(SectionsTest, AFileSystemHasItsSourceAndItsPlace) {
