@@ -4,8 +4,10 @@
 #include "IpmiText.h"
 
 #include <array>
+#include <future>
 #include <memory>
 #include <optional>
+#include <thread>
 #include <utility>
 
 namespace NQRVZEP20 {
@@ -19,6 +21,8 @@ std::string FileOf(TIpmiRequest const& request) {
   return "ipmi/" + HexText(bytes) + "-" + HexText(request.fData);
 }
 
+TMissing TimeIsUp() { return {kMissingTimeIsUp, "the time limit for reading the controller had expired"}; }
+
 // Keeps the reason why no further command is sent.
 struct TLimit {
   TIpmi fIpmi;
@@ -26,8 +30,7 @@ struct TLimit {
   std::optional<TMissing> fWhyNot = std::nullopt;
 
   TFinding<std::string> Send(TIpmiRequest const& request) {
-    if (!fWhyNot && TClock::now() >= fEnd)
-      fWhyNot = TMissing{kMissingTimeIsUp, "the time limit for reading the controller had expired"};
+    if (!fWhyNot && TClock::now() >= fEnd) fWhyNot = TimeIsUp();
     if (fWhyNot) return *fWhyNot;
     auto answer = fIpmi(request);
     if (!answer) fWhyNot = answer.Why();
@@ -50,6 +53,16 @@ TIpmi SessionConnection(TZepController const& controller) {
 TIpmi WithinTime(TIpmi ipmi, TClock::duration limit) {
   auto const state = std::make_shared<TLimit>(TLimit{std::move(ipmi), TClock::now() + limit});
   return [state](TIpmiRequest const& request) { return state->Send(request); };
+}
+
+TIpmi InThreads(TIpmi ipmi, TClock::duration limit) {
+  return [ipmi = std::move(ipmi), end = TClock::now() + limit](TIpmiRequest const& request) -> TFinding<std::string> {
+    std::packaged_task<TFinding<std::string>()> task([ipmi, request] { return ipmi(request); });
+    auto answer = task.get_future();
+    std::thread(std::move(task)).detach();
+    if (answer.wait_until(end) != std::future_status::ready) return TimeIsUp();
+    return answer.get();
+  };
 }
 
 TIpmi Recorded(TIpmi ipmi, TMachineFiles const& files) {

@@ -6,18 +6,28 @@
 #include "providers/reasons/TMachineFiles.h"
 
 #include <chrono>
+#include <string>
+#include <vector>
 
 namespace NQRVZEP20 {
 
-// The controller of this machine, through the IPMI driver of the kernel (/dev/ipmi0) and libfreeipmi. Each command fails with the
-// reason if there is no driver. The returned function owns the open device; call it from one thread at a time.
-TIpmi LocalConnection();
+// The files of the kernel's IPMI driver, under its present and former names.
+std::vector<std::string> LocalDevices();
+
+// The controller of this machine, through the first device that exists, and libfreeipmi. The first command opens the device. Each
+// command fails with the reason if there is no device. The returned function owns the open device; call it from one thread at a
+// time. A command blocks as long as the driver does: see InThreads.
+TIpmi LocalConnection(std::vector<std::string> const& devices = LocalDevices());
 
 // A session of the front end.
 TIpmi SessionConnection(TZepController const& controller);
 
 // Sends no command after `limit`, or after one that was not answered: each of them would take its own time.
 TIpmi WithinTime(TIpmi ipmi, std::chrono::steady_clock::duration limit);
+
+// Sends each command by a thread of its own, for a library that may hang. When `ipmi` has not returned by the limit, it is left
+// behind with its thread, and a copy of it remains until the process ends; send no further command then (WithinTime).
+TIpmi InThreads(TIpmi ipmi, std::chrono::steady_clock::duration limit);
 
 // The recorded answers below the root of `files`, or those of `ipmi`, which are recorded if ZEP_RECORD_ANSWERS is set
 // (TMachineFiles::Answer). There is a file for each request: "ipmi/0a23-070001000005".

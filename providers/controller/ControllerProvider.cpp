@@ -23,7 +23,8 @@ TZepController const* gRemote = nullptr;
 TIpmi Connection() {
   if (gRemote != nullptr) return WithinTime(SessionConnection(*gRemote), std::chrono::milliseconds(gRemote->fMilliseconds));
   TMachineFiles const files = TMachineFiles::OfThisProcess();
-  return Recorded(files.IsThisMachine() ? WithinTime(LocalConnection(), kLocalLimit) : TIpmi(), files);
+  if (!files.IsThisMachine()) return Recorded(TIpmi(), files);
+  return Recorded(WithinTime(InThreads(LocalConnection(), kLocalLimit), kLocalLimit), files);
 }
 
 // No cache while answers are recorded or read from a recording, because a recording has all of them.

@@ -8,12 +8,11 @@
 #include <cerrno>
 #include <cstring>
 #include <memory>
+#include <optional>
 
 namespace NQRVZEP20 {
 
 namespace {
-
-constexpr char const* kDevices[] = {"/dev/ipmi0", "/dev/ipmi/0", "/dev/ipmidev/0"};
 
 struct TCloser {
   void operator()(ipmi_ctx_t context) const noexcept {
@@ -23,16 +22,16 @@ struct TCloser {
 };
 using TContext = std::shared_ptr<ipmi_ctx>;
 
-TMissing WhyNotOpened(char const* device, int error) {
-  if (error == EACCES || error == EPERM) return {kMissingNeedsRoot, std::string("only root may use ") + device};
-  return {kMissingUnreadable, std::string(device) + " cannot be opened: " + std::strerror(error)};
+TMissing WhyNotOpened(std::string const& device, int error) {
+  if (error == EACCES || error == EPERM) return {kMissingNeedsRoot, "only root may use " + device};
+  return {kMissingUnreadable, device + " cannot be opened: " + std::strerror(error)};
 }
 
-TFinding<std::string> FindDevice() {
-  for (char const* const device : kDevices) {
-    if (::access(device, F_OK) != 0) continue;
-    if (::access(device, R_OK | W_OK) != 0) return WhyNotOpened(device, errno);
-    return std::string(device);
+TFinding<std::string> FindDevice(std::vector<std::string> const& devices) {
+  for (std::string const& device : devices) {
+    if (::access(device.c_str(), F_OK) != 0) continue;
+    if (::access(device.c_str(), R_OK | W_OK) != 0) return WhyNotOpened(device, errno);
+    return device;
   }
   return TMissing{kMissingNoSource,
                   "the kernel has no /dev/ipmi0: this machine has no management controller, or the modules ipmi_si and "
@@ -58,10 +57,13 @@ TFinding<std::string> Send(ipmi_ctx_t context, TIpmiRequest const& request) {
 
 }  // namespace
 
-TIpmi LocalConnection() {
-  auto const context = FindDevice().Then(Open);
-  return [context](TIpmiRequest const& request) {
-    return context.Then([&](TContext const& open) { return Send(open.get(), request); });
+std::vector<std::string> LocalDevices() { return {"/dev/ipmi0", "/dev/ipmi/0", "/dev/ipmidev/0"}; }
+
+TIpmi LocalConnection(std::vector<std::string> const& devices) {
+  auto const context = std::make_shared<std::optional<TFinding<TContext>>>();
+  return [context, devices](TIpmiRequest const& request) {
+    if (!*context) *context = FindDevice(devices).Then(Open);
+    return (*context)->Then([&](TContext const& open) { return Send(open.get(), request); });
   };
 }
 
