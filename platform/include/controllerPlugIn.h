@@ -5,14 +5,15 @@
 /*
  * How a front end makes the provider plug-in libController.nsp.so read a remote controller, over a session of the front end,
  * instead of the controller of this machine: it passes the address of a TZepController, as a uint64, in the entry
- * kZepControllerEntry of the context of GetNamespace, at the first call.
+ * kZepControllerEntry of the context of GetNamespace, at the first call. The name of the entry changes whenever the structure
+ * does, so that a plug-in of another version does not misread it.
  */
 
 #ifdef __cplusplus
 extern "C" {
 #endif
 
-#define kZepControllerEntry "zep controller"
+#define kZepControllerEntry "zep controller, time in milliseconds"
 
 enum { kZepControllerAnswerSize = 300 };
 
