@@ -52,14 +52,20 @@ void WriteSensors(TRecordWriter& writer, TController const& controller, TCompute
     for (TRecord const& record : *records) writer.Associate(kSystemDevice, system.Record(), record);
 }
 
+// A device that was not read has an instance with the reasons, unless it is the only one.
 void WritePackages(TRecordWriter& writer, TController const& controller) {
-  std::set<std::uint8_t> seen;
+  auto const& devices = controller.fFrus;
+  std::set<std::pair<int, int>> seen;
   TRecords records;
   TMissing whyNone{kMissingNotGiven, "the controller has no FRU data"};
-  for (TFruDevice const& device : controller.fFrus) {
-    if (!device.fAreas) whyNone = device.fAreas.Why();
-    if (!device.fAreas || !seen.insert(device.fNumber).second) continue;
-    for (TFruArea const& area : *device.fAreas) records.push_back(PackageRecord(device, area));
+  for (TFruDevice const& device : devices) {
+    if (!seen.insert({device.fController, device.fNumber}).second) continue;
+    if (!device.fAreas && devices.size() == 1)
+      whyNone = device.fAreas.Why();
+    else if (!device.fAreas)
+      records.push_back(PackageRecord(device, UnreadArea(device.fAreas.Why())));
+    else
+      for (TFruArea const& area : *device.fAreas) records.push_back(PackageRecord(device, area));
   }
   writer.Write(PackageRecord({}, {}), records, whyNone);
 }
@@ -69,16 +75,25 @@ auto StateOf(TSelEntry const& entry) {
   return std::make_tuple(entry.fOwner, entry.fSensorType, entry.fSensorNumber, entry.fEventType, entry.fData[0] & 0x0F);
 }
 
+bool IsOf(TSelEntry const& entry, TSdrSensor const& sensor) {
+  return entry.fKind == TSelEntry::EKind::kEvent && sensor.fOwner == entry.fOwner && sensor.fNumber == entry.fSensorNumber;
+}
+
 TSdrSensor const* SensorOf(TSelEntry const& entry, TController const& controller) {
-  if (entry.fKind != TSelEntry::EKind::kEvent) return nullptr;
-  auto const isMeant = [&](TSdrSensor const& sensor) {
-    return sensor.fOwner == entry.fOwner && sensor.fNumber == entry.fSensorNumber;
-  };
   for (TSensorState const& state : controller.fSensors)
-    if (isMeant(state.fSensor)) return &state.fSensor;
+    if (IsOf(entry, state.fSensor)) return &state.fSensor;
   for (TSdrSensor const& sensor : controller.fEventSensors)
-    if (isMeant(sensor)) return &sensor;
+    if (IsOf(entry, sensor)) return &sensor;
   return nullptr;
+}
+
+// Whether the entry is about a threshold, and the sensor is within it now. Many controllers do not log the end of such a state.
+bool IsWithinThreshold(TSelEntry const& entry, TController const& controller) {
+  if (entry.fEventType != kThresholdReading) return false;
+  unsigned const place = (entry.fData[0] & 0x0FU) / 2;  // TRawThresholds::EPlace; each has an event for either direction
+  return std::any_of(controller.fSensors.begin(), controller.fSensors.end(), [&](TSensorState const& state) {
+    return IsOf(entry, state.fSensor) && state.fStates && (*state.fStates >> place & 1) == 0;
+  });
 }
 
 TFinding<std::uint64_t> AgeOf(TSelEntry const& entry, TFinding<std::uint64_t> const& clock) {
@@ -100,7 +115,7 @@ std::vector<TLoggedEvent> EventsOf(TEventLog const& log, TController const& cont
   std::for_each(log.fEntries.rbegin(), log.fEntries.rend(), [&](TSelEntry const& entry) {
     bool const isEvent = entry.fKind == TSelEntry::EKind::kEvent;
     if (isEvent && entry.fIsDeasserted) ended.insert(StateOf(entry));
-    bool const hasEnded = isEvent && ended.count(StateOf(entry)) > 0;
+    bool const hasEnded = isEvent && (ended.count(StateOf(entry)) > 0 || IsWithinThreshold(entry, controller));
     if (seen.insert(entry.fId).second) events.push_back({entry, SensorOf(entry, controller), AgeOf(entry, log.fClock), hasEnded});
   });
   std::reverse(events.begin(), events.end());

@@ -14,7 +14,7 @@ constexpr std::uint8_t kGetChannelInfo = 0x42, kGetUserAccess = 0x44, kGetUserNa
 constexpr std::uint8_t kGetLanParameter = 0x02;                                             // kTransport
 constexpr std::uint8_t kGetReading = 0x2D, kGetThresholds = 0x27;                           // kSensorEvent
 constexpr std::uint8_t kGetFruInfo = 0x10, kReadFru = 0x11;                                 // kStorage
-constexpr std::uint8_t kLanMedium = 4, kThisController = 0x20, kLastChannel = 11;
+constexpr std::uint8_t kLanMedium = 4, kLastChannel = 11;
 constexpr std::size_t kFruPart = 0x20;
 
 char Char(std::size_t byte) { return static_cast<char>(byte); }

@@ -71,19 +71,23 @@ std::string PackageKindOf(TFruArea const& area) {
       return "chassis";
     case TFruArea::EKind::kBoard:
       return "board";
-    default:
+    case TFruArea::EKind::kProduct:
       return "product";
+    default:
+      return "unread";
   }
 }
 
 std::uint16_t PackageTypeOf(TFruArea const& area) {
-  constexpr std::uint16_t other = 1, chassis = 3, card = 9;
+  constexpr std::uint16_t unknown = 0, other = 1, chassis = 3, card = 9;
+  if (area.fKind == TFruArea::EKind::kUnread) return unknown;
   if (area.fKind == TFruArea::EKind::kChassis) return chassis;
   return area.fKind == TFruArea::EKind::kBoard ? card : other;
 }
 
 // The maker's own fields, and the name of the file that the area was written from.
 TFinding<std::string> OtherTextsOf(TFruArea const& area) {
+  if (area.fKind == TFruArea::EKind::kUnread) return area.fName.Why();
   std::string text;
   for (std::string const& field : area.fCustom) text += (text.empty() ? "" : "; ") + field;
   if (area.fFileId) text += (text.empty() ? "" : "; ") + ("FRU file " + *area.fFileId);
@@ -185,7 +189,8 @@ TRecord PackageRecord(TFruDevice const& device, TFruArea const& area) {
   std::string const kind = PackageKindOf(area);
   TRecord record("CIM_PhysicalPackage", "IPMI FRU data");
   record.AddKey("CreationClassName", "CIM_PhysicalPackage");
-  record.AddKey("Tag", "ipmi FRU " + std::to_string(device.fNumber) + " " + kind);
+  std::string const owner = device.fController == kThisController ? "" : Hex(device.fController) + " ";
+  record.AddKey("Tag", "ipmi " + owner + "FRU " + std::to_string(device.fNumber) + " " + kind);
   record.Add("ElementName", Known(device.fName + " " + kind));
   record.Add("PackageType", Known(PackageTypeOf(area))).Names(kPackageTypeNames);
   record.Add("Manufacturer", area.fManufacturer);

@@ -113,6 +113,8 @@ TFruArea AreaAt(EKind kind, std::string_view content, std::size_t offset) {
 
 }  // namespace
 
+TFruArea UnreadArea(TMissing const& why) { return AreaWith(EKind::kUnread, why); }
+
 TFinding<std::vector<TFruArea>> FruAreasFrom(std::string_view content) {
   TBytes const bytes(content);
   bool const isHeader = (bytes.At(0) & 0x0F) == 1 && content.size() >= kUnit && SumsToZero(content.substr(0, kUnit));

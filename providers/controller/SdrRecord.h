@@ -29,6 +29,8 @@ struct TRawThresholds {
   std::uint8_t fRaw[kCount] = {};
 };
 
+constexpr std::uint8_t kThisController = 0x20;  // the address of the controller that is read
+
 constexpr std::uint8_t kThresholdReading = 1;  // the reading type of sensors with thresholds
 
 // A sensor of the repository of sensor data records (SDR).

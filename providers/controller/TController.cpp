@@ -11,7 +11,6 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr std::uint8_t kGetDeviceId = 0x01, kGetGuid = 0x37;
-constexpr std::uint8_t kThisController = 0x20;
 
 std::vector<TSdrRecord> ParsedRecords(std::vector<std::string> const& records) {
   std::vector<TSdrRecord> parsed;
@@ -33,15 +32,22 @@ void ReadSensors(TController& controller, TIpmi const& ipmi, std::vector<TSdrRec
   }
 }
 
-// Device 0 is the controller's own, and has no record.
+TFinding<std::vector<TFruArea>> AreasOf(TFruLocator const& fru, TIpmi const& ipmi) {
+  if (fru.fController != kThisController || fru.fLun != 0)
+    return TMissing{kMissingNotGiven, "the FRU device belongs to another controller or another LUN, which is not queried"};
+  if (!fru.fIsLogical) return TMissing{kMissingNotGiven, "the FRU device is on a bus of the controller, which is not read"};
+  return ReadFru(ipmi, fru.fDevice);
+}
+
+// Device 0 is the controller's own, and needs no record.
 void ReadFrus(TController& controller, TIpmi const& ipmi, std::vector<TSdrRecord> const& records) {
-  controller.fFrus.push_back({0, "FRU 0", ReadFru(ipmi, 0)});
+  controller.fFrus.push_back({kThisController, 0, "FRU 0", ReadFru(ipmi, 0)});
   for (TSdrRecord const& record : records) {
-    if (!record.fFru || !record.fFru->fIsLogical || record.fFru->fController != kThisController || record.fFru->fDevice == 0)
-      continue;
-    std::uint8_t const number = record.fFru->fDevice;
-    std::string const name = record.fFru->fName ? *record.fFru->fName : "FRU " + std::to_string(number);
-    controller.fFrus.push_back({number, name, ReadFru(ipmi, number)});
+    if (!record.fFru) continue;
+    TFruLocator const& fru = *record.fFru;
+    if (fru.fController == kThisController && fru.fIsLogical && fru.fDevice == 0) continue;
+    std::string const name = fru.fName ? *fru.fName : "FRU " + std::to_string(fru.fDevice);
+    controller.fFrus.push_back({fru.fController, fru.fDevice, name, AreasOf(fru, ipmi)});
   }
 }
 

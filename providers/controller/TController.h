@@ -49,7 +49,7 @@ struct TSensorState {
 
 // A FRU device.
 struct TFruDevice {
-  std::uint8_t fNumber = 0;
+  std::uint8_t fController = 0x20, fNumber = 0;
   std::string fName;
   TFinding<std::vector<TFruArea>> fAreas = TMissing{};
 };

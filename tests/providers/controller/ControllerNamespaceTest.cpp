@@ -123,6 +123,30 @@ TEST_F(ControllerNamespaceTest, AnEventHasTheNameOfASensorThatOnlyReportsEvents)
   EXPECT_THAT(text, Not(HasSubstr("  CurrentState: <")));
 }
 
+TEST_F(ControllerNamespaceTest, AThresholdEventOfASensorThatIsWithinItHasEnded) {
+  fController.fEvents = {SelEvent(0, 1, 0x30, 1, 0x59, 91, 90)};  // upper critical, going high; its end is not in the log
+  EXPECT_THAT(Fill(), Not(HasSubstr("HasEnded: true"))) << "the sensor is beyond it";
+  fController.fAnswers[Bytes({4, 0x2D, 0x30})] = Bytes({0, 85, 0xC0, 0x08, 0});  // only beyond the non-critical threshold
+  fNs = NewNamespace();
+  EXPECT_THAT(Fill(), HasSubstr("HasEnded: true"));
+  fController.fAnswers[Bytes({4, 0x2D, 0x30})] = Bytes({0, 85, 0xE0, 0x08, 0});  // the reading is unavailable
+  fNs = NewNamespace();
+  EXPECT_THAT(Fill(), Not(HasSubstr("HasEnded: true")));
+}
+
+TEST_F(ControllerNamespaceTest, AFruDeviceThatIsNotReadHasTheReason) {
+  std::string other = FruLocatorRecord(3, 5, "Node 2"), onBus = FruLocatorRecord(4, 6, "DIMM A1");
+  other[5] = 0x22;  // the address of another controller
+  onBus[7] = 0;
+  fController.fRecords.insert(fController.fRecords.end(), {other, onBus});
+  std::string const text = Fill();
+  EXPECT_THAT(text, HasSubstr("Tag=\"ipmi 0x22 FRU 5 unread\""));
+  EXPECT_THAT(text,
+              HasSubstr("Manufacturer: <the FRU device belongs to another controller or another LUN, which is not queried>"));
+  EXPECT_THAT(text, HasSubstr("ElementName: DIMM A1 unread\n"));
+  EXPECT_THAT(text, HasSubstr("SerialNumber: <the FRU device is on a bus of the controller, which is not read>"));
+}
+
 TEST_F(ControllerNamespaceTest, AnEntryWithoutATimeHasTheUnknownTimeAsItsKey) {
   std::string makers = SelEvent(0, 1, 0x30, 1, 0x59);
   makers[2] = '\xE0';  // a form without a time
