@@ -2,13 +2,9 @@
 
 // zep remote --inventory, compared with ipmitool value by value, on a simulated controller with sensors and events.
 
-#include "tests/providers/controller/ControllerBytes.h"
-#include "tests/system/ipmi/IpmiBed.h"
-#include "tests/tools/zep/Envelope.h"
-#include "tests/tools/zep/Zep.h"
+#include "tests/system/ipmi/InventoryBed.h"
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include <cmath>
 #include <sstream>
@@ -19,85 +15,6 @@ namespace {
 using nlohmann::json;
 using testing::HasSubstr;
 using testing::Not;
-
-using TCells = std::vector<std::string>;
-
-std::string Trimmed(std::string const& text) {
-  std::size_t const begin = text.find_first_not_of(' ');
-  return begin == std::string::npos ? "" : text.substr(begin, text.find_last_not_of(' ') + 1 - begin);
-}
-
-// The lines of a table, split at `separator`.
-std::vector<TCells> RowsOf(std::string const& text, char separator) {
-  std::vector<TCells> rows;
-  std::istringstream lines(text);
-  for (std::string line; std::getline(lines, line);) {
-    std::istringstream cells(line);
-    rows.emplace_back();
-    for (std::string cell; std::getline(cells, cell, separator);) rows.back().push_back(Trimmed(cell));
-  }
-  return rows;
-}
-
-class InventoryTest : public testing::Test {
-protected:
-  void SetUp() override {
-    NEEDS(HasIpmiBed(), kIpmiBedNeeds);
-    NEEDS(std::system("command -v ipmitool >/dev/null") == 0, "ipmitool");
-    EnterNetworkNamespace();
-    for (char const* library : {"libipmiClient.so", "libController.nsp.so"})
-      fZep.Add(library, TEST_LIB_DIR "/" + std::string(library));
-    TSimulator::TSettings settings;
-    settings.fFru = FruImage();
-    settings.fMore = SourcePath("tests/system/ipmi/sim/sensors.emu");
-    fSimulator.emplace(settings);
-    fSimulator->WaitUntilReady();
-  }
-
-  // Three areas, and the identity at its place after them.
-  std::string FruImage() const {
-    std::string image = FruDevice();
-    image.resize(1024, '\xFF');
-    image.replace(0x1AC, 8, "1234AB7\0"s);
-    image.replace(0x1CC, 8, "KQ12345\0"s);
-    WriteFile(fDir.Path("fru"), image);
-    return fDir.Path("fru");
-  }
-
-  zep::TRun Run(std::vector<std::string> arguments) {
-    arguments.insert(arguments.begin(), {"remote", "--user", "zepadmin"});
-    return fZep.Run({arguments, {{"ZEP_BMC_PASSWORD", "zeppass1"}, {"XDG_CACHE_HOME", fDir.Path("cache")}}});
-  }
-
-  json Inventory() {
-    zep::TRun const run = Run({"127.0.0.1", "--inventory", "--json"});
-    EXPECT_EQ(run.fStatus, 0) << run.fErrors;
-    zep::ExpectEnvelope(run.fOutput, 0, "zep remote");
-    return json::parse(run.fOutput);
-  }
-
-  static json const& Instance(json const& document, std::string const& className, std::string const& property,
-                              std::string const& value) {
-    static json const none;
-    for (json const& instance : document["instances"])
-      if (instance["class"] == className && instance["properties"][property]["value"] == value) return instance["properties"];
-    ADD_FAILURE() << "no " << className << " with " << property << " " << value;
-    return none;
-  }
-
-  // The output of ipmitool, which gets the password from its environment.
-  std::string Ipmitool(std::string const& command) const {
-    std::string const file = fDir.Path("ipmitool");
-    std::string const line =
-        "IPMI_PASSWORD=zeppass1 ipmitool -I lanplus -C 3 -H 127.0.0.1 -U zepadmin -E " + command + " >" + file + " 2>/dev/null";
-    EXPECT_EQ(std::system(line.c_str()), 0) << command;
-    return ReadFile(file);
-  }
-
-  TTempDir const fDir;
-  zep::TInstallation fZep;
-  std::optional<TSimulator> fSimulator;
-};
 
 double NumberOf(json const& sensor, char const* property) {
   json const& value = sensor[property]["value"];
@@ -162,46 +79,76 @@ TEST_F(InventoryTest, EventsAgreeWithIpmitool) {
   EXPECT_THAT(document.dump(), HasSubstr("Critical"));
 }
 
+// `output` has a line "label : value".
+void ExpectLine(std::string const& output, std::string const& label, std::string const& value) {
+  std::string found = "no such line";
+  for (TCells const& row : RowsOf(output, ':')) {
+    if (row.empty() || row[0] != label) continue;
+    found = "";
+    for (std::size_t i = 1; i < row.size(); ++i) found += (i > 1 ? ":" : "") + row[i];
+  }
+  EXPECT_EQ(found, value) << label;
+}
+
 TEST_F(InventoryTest, TheOtherPartsAgreeWithIpmitool) {
   json const document = Inventory();
-  std::string const mc = Ipmitool("mc info"), fru = Ipmitool("fru print 0"), lan = Ipmitool("lan print 1"),
-                    users = Ipmitool("user list 1");
+  std::string const mc = Ipmitool("mc info"), fru = Ipmitool("fru print 0");
   json const& controller = Instance(document, "ZEP_ManagementController", "ElementName", "management controller");
-  auto const expectLine = [](std::string const& output, std::string const& label, std::string const& value) {
-    std::string found = "no such line";
-    for (TCells const& row : RowsOf(output, ':'))
-      if (row.at(0) == label) found = row.size() > 1 ? row[1] : "";
-    EXPECT_EQ(found, value) << label;
-  };
-  expectLine(mc, "Firmware Revision", controller["FirmwareVersion"]["value"]);
-  expectLine(mc, "IPMI Version", controller["IPMIVersion"]["value"]);
-  expectLine(mc, "Manufacturer ID", std::to_string(controller["ManufacturerID"]["value"].get<int>()));
-  expectLine(mc, "Device ID", std::to_string(controller["DeviceNumber"]["value"].get<int>()));
+  ExpectLine(mc, "Firmware Revision", controller["FirmwareVersion"]["value"]);
+  ExpectLine(mc, "IPMI Version", controller["IPMIVersion"]["value"]);
+  ExpectLine(mc, "Manufacturer ID", std::to_string(controller["ManufacturerID"]["value"].get<int>()));
+  char product[32];
+  unsigned const number = controller["ProductID"]["value"];
+  std::snprintf(product, sizeof product, "%u (0x%04x)", number, number);
+  ExpectLine(mc, "Product ID", product);
+  ExpectLine(mc, "Device ID", std::to_string(controller["DeviceNumber"]["value"].get<int>()));
 
   json const& chassis = Instance(document, "CIM_PhysicalPackage", "ElementName", "FRU 0 chassis");
   json const& board = Instance(document, "CIM_PhysicalPackage", "ElementName", "FRU 0 board");
-  json const& product = Instance(document, "CIM_PhysicalPackage", "ElementName", "FRU 0 product");
-  expectLine(fru, "Chassis Part Number", chassis["PartNumber"]["value"]);
-  expectLine(fru, "Chassis Serial", chassis["SerialNumber"]["value"]);
-  expectLine(fru, "Chassis Extra", chassis["OtherIdentifyingInfo"]["value"]);
-  expectLine(fru, "Board Mfg", board["Manufacturer"]["value"]);
-  expectLine(fru, "Board Product", board["Model"]["value"]);
-  expectLine(fru, "Board Serial", board["SerialNumber"]["value"]);
-  expectLine(fru, "Board Part Number", board["PartNumber"]["value"]);
-  expectLine(fru, "Product Manufacturer", product["Manufacturer"]["value"]);
-  expectLine(fru, "Product Name", product["Model"]["value"]);
-  expectLine(fru, "Product Part Number", product["PartNumber"]["value"]);
-  expectLine(fru, "Product Version", product["Version"]["value"]);
-  expectLine(fru, "Product Serial", product["SerialNumber"]["value"]);
-  expectLine(fru, "Product Asset Tag", product["UserTracking"]["value"]);
+  json const& productArea = Instance(document, "CIM_PhysicalPackage", "ElementName", "FRU 0 product");
+  ExpectLine(fru, "Chassis Part Number", chassis["PartNumber"]["value"]);
+  ExpectLine(fru, "Chassis Serial", chassis["SerialNumber"]["value"]);
+  ExpectLine(fru, "Chassis Extra", chassis["OtherIdentifyingInfo"]["value"]);
+  ExpectLine(fru, "Board Mfg", board["Manufacturer"]["value"]);
+  ExpectLine(fru, "Board Product", board["Model"]["value"]);
+  ExpectLine(fru, "Board Serial", board["SerialNumber"]["value"]);
+  ExpectLine(fru, "Board Part Number", board["PartNumber"]["value"]);
+  ExpectLine(fru, "Product Manufacturer", productArea["Manufacturer"]["value"]);
+  ExpectLine(fru, "Product Name", productArea["Model"]["value"]);
+  ExpectLine(fru, "Product Part Number", productArea["PartNumber"]["value"]);
+  ExpectLine(fru, "Product Version", productArea["Version"]["value"]);
+  ExpectLine(fru, "Product Serial", productArea["SerialNumber"]["value"]);
+  ExpectLine(fru, "Product Asset Tag", productArea["UserTracking"]["value"]);
+}
 
-  std::string source = Instance(document, "ZEP_ControllerNetwork", "ElementName", "channel 1")["AddressSource"]["value"];
-  source[0] = static_cast<char>(std::toupper(source[0]));
-  expectLine(lan, "IP Address Source", source);
-  for (char const* name : {"zepadmin", "zepuser", "zepoff", "zep16"}) {
-    std::string privilege = Instance(document, "ZEP_ControllerAccount", "UserID", name)["Privilege"]["value"];
+TEST_F(InventoryTest, TheNetworkAgreesWithIpmitool) {
+  json const document = Inventory();
+  std::string const lan = Ipmitool("lan print 1");
+  json const& channel = Instance(document, "ZEP_ControllerNetwork", "ElementName", "channel 1");
+  EXPECT_EQ(channel["AddressSource"]["value"], "static");
+  ExpectLine(lan, "IP Address Source", "Static Address");
+  EXPECT_EQ(channel["IPv4Address"]["value"], "192.0.2.7") << "the simulator has the parameters";
+  ExpectLine(lan, "IP Address", channel["IPv4Address"]["value"]);
+  ExpectLine(lan, "Subnet Mask", channel["SubnetMask"]["value"]);
+  ExpectLine(lan, "MAC Address", channel["MACAddress"]["value"]);
+  ExpectLine(lan, "Default Gateway IP", channel["DefaultGateway"]["value"]);
+  ExpectLine(lan, "802.1q VLAN ID", channel["VLANID"]["value"].is_null() ? "Disabled" : channel["VLANID"]["value"].dump());
+}
+
+TEST_F(InventoryTest, TheAccountsAgreeWithIpmitool) {
+  json const document = Inventory();
+  std::map<json, std::string> const states = {{nullptr, "unknown"}, {2, "enabled"}, {3, "disabled"}};
+  std::map<std::string, int> const accounts = {{"zepadmin", 2}, {"zepuser", 3}, {"zepoff", 4}, {"zep16", 5}};
+  for (auto const& [name, number] : accounts) {
+    SCOPED_TRACE(name);
+    std::string const access = Ipmitool("channel getaccess 1 " + std::to_string(number));
+    json const& account = Instance(document, "ZEP_ControllerAccount", "UserID", name);
+    ExpectLine(access, "User Name", name);
+    ExpectLine(access, "Enable Status", states.at(account["EnabledState"]["value"]));
+    ExpectLine(access, "IPMI Messaging", account["HasLANAccess"]["value"] == true ? "enabled" : "disabled");
+    std::string privilege = account["Privilege"]["value"];
     for (char& letter : privilege) letter = static_cast<char>(std::toupper(letter));
-    EXPECT_THAT(users, testing::ContainsRegex(std::string(name) + " .*" + privilege));
+    ExpectLine(access, "Privilege Level", privilege);
   }
 }
 
@@ -256,29 +203,10 @@ TEST_F(InventoryTest, ProgressIsShownOnATerminal) {
     EXPECT_THAT(screen, HasSubstr(std::string("\r\x1b[Kzep: ") + step));
 }
 
-TEST_F(InventoryTest, AListOfHostsHasOneDocumentEach) {
-  TSimulator::TSettings settings;
-  settings.fAddress = "127.0.0.2";
-  settings.fFru = FruImage();
-  settings.fMore = SourcePath("tests/system/ipmi/sim/sensors.emu");
-  TSimulator other(settings);
-  other.WaitUntilReady();
-  WriteFile(fDir.Path("hosts"), "127.0.0.1\n127.0.0.2\n");
-  zep::TRun const run = Run({"--hosts", fDir.Path("hosts"), "--inventory"});
-  EXPECT_EQ(run.fStatus, 0);
-  std::istringstream lines(run.fOutput);
-  std::size_t documents = 0;
-  for (std::string line; std::getline(lines, line); ++documents)
-    EXPECT_EQ(Instance(json::parse(line), "CIM_NumericSensor", "ElementName", "Fan 1")["CurrentReading"]["value"], 4500);
-  EXPECT_EQ(documents, 2U);
-}
-
 TEST_F(InventoryTest, AControllerThatFallsSilentLeavesWhatWasReadInTime) {
   fSimulator.reset();
-  TSimulator::TSettings settings;
+  TSimulator::TSettings settings = Settings();
   settings.fPort = 6230;
-  settings.fFru = FruImage();
-  settings.fMore = SourcePath("tests/system/ipmi/sim/sensors.emu");
   TSimulator controller(settings);
   controller.WaitUntilReady();
   constexpr int answers = 50;  // then the network loses everything

@@ -77,6 +77,7 @@ TSimulator::TSimulator(TSettings const& settings) {
                                         settings.fPassword.c_str()};
   if (!settings.fFru.empty()) arguments.insert(arguments.end(), {"--fru", settings.fFru.c_str()});
   if (!settings.fMore.empty()) arguments.insert(arguments.end(), {"--more", settings.fMore.c_str()});
+  if (settings.fHasLan) arguments.push_back("--lan");
   arguments.insert(arguments.end(), {port.c_str(), nullptr});
   fScript = ::fork();
   if (fScript == 0) {

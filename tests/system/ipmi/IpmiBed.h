@@ -39,6 +39,7 @@ public:
     std::string fPassword = "zeppass1";
     std::string fFru = {};   // a complete FRU image instead of the two texts
     std::string fMore = {};  // a file with further commands for the simulator
+    bool fHasLan = false;    // whether it has the LAN parameters of sim/lan-config.sh
   };
 
   explicit TSimulator(TSettings const& settings);
