@@ -1,8 +1,8 @@
 #!/bin/sh
 # SPDX-License-Identifier: Apache-2.0
 #
-# Looks for problems in a container: a bare tree with network, devices and processes of its own. zep must find nothing that it does
-# not find outside of the container as well, such as the state of the clock, which is that of the kernel.
+# Looks for problems in a container: a bare tree with network, devices and processes of its own. zep must find nothing but what the
+# container shares with its host, the state of the kernel, its clock and the processor; and this only if it finds it outside, too.
 #
 #   healthy-container.sh BUILD    exit status: 0 if it does, otherwise 1; 77 if no container can be made, unless CI is "true"
 #
@@ -49,10 +49,11 @@ def problems(path):
             sys.exit(f"{path}: {plugin['name']} failed: {errors}")
     return {each["rule"] for each in document["findings"]["problems"]}
 
+OF_KERNEL = {"clock-synchronized", "kernel-taint", "processor-weakness"}
 container, machine = (problems(path) for path in sys.argv[1:])
-print(f"{len(container)} findings in the container, {len(machine)} outside")
-added = sorted(container - machine)
-for each in added:
-    print(f"only in the container: {each}")
-sys.exit(1 if added else 0)
+print(f"in the container: {sorted(container)}, outside: {sorted(machine)}")
+wrong = sorted(container - (OF_KERNEL & machine))
+for each in wrong:
+    print(f"a healthy container has {each}")
+sys.exit(1 if wrong else 0)
 END

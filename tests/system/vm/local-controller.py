@@ -158,6 +158,8 @@ def check_findings(run):
         outcomes = {rule["id"]: rule["outcome"] for rule in findings["rules"]}
         for rule in RULES:
             run.expect(f"{name}: {rule}", rule in faults, outcomes[rule] == "wrong")
+        if not faults:
+            run.expect(f"{name}: problems", [], [each["reason"] for each in findings["problems"]])
         for problem in findings["problems"]:
             if problem["rule"] in faults:
                 print(f"{name}: {problem['rule']} {problem['severity']}: {problem['reason']} [{problem['remedy']}]")

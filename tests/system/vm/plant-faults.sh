@@ -2,7 +2,8 @@
 # SPDX-License-Identifier: Apache-2.0
 #
 # Lets zep look for problems in this virtual machine: healthy, with faults, and mended. Runs inside the machine of
-# planted-faults.sh. Its third serial port is QEMU's monitor (QMP), by which it unplugs a cable.
+# planted-faults.sh. Its third serial port is QEMU's monitor (QMP), by which it unplugs a cable and
+# pulls out a disk.
 #
 #   plant-faults.sh ZEP I2C_STUB      I2C_STUB: the kernel module of that name
 #
@@ -15,6 +16,14 @@ echo finding-clock-grace-minutes=0 > zep.cfg
 ask() {  # ask NAME: writes the report
   "$zep" report --json --plugin-timeout 120 > "/out/$1.json" 2> "/out/$1.err"
 }
+disk() { for name in /sys/block/sd*; do [ ! -e "$name" ] || echo "/dev/${name##*/}"; done; }  # the second disk
+await() {  # await COMMAND...: until it succeeds
+  for _ in $(seq 100); do if "$@"; then return; fi; sleep 0.1; done
+  echo "timed out: $*" >&2
+  exit 1
+}
+has_disk() { [ -n "$(disk)" ]; }
+has_no_disk() { [ -z "$(disk)" ]; }
 qmp() { printf '\377\n%s\n' "$1" >&9; }  # the byte 0xff ends what QEMU may have received before
 monitor() { qmp "{\"execute\":\"human-monitor-command\",\"arguments\":{\"command-line\":\"$1\"}}"; }
 # As a time service does when it has set the clock: adjtimex with the modes ADJ_STATUS and ADJ_MAXERROR, and without STA_UNSYNC.
@@ -25,7 +34,8 @@ sensor_limit() {
 
 hostname faults
 # A mirror of two disks with a file system, and a bond of two ports.
-mdadm --create /dev/md0 --run --level=1 --raid-devices=2 --metadata=1.2 --assume-clean /dev/vda /dev/vdb
+await has_disk
+mdadm --create /dev/md0 --run --level=1 --raid-devices=2 --metadata=1.2 --assume-clean /dev/vda "$(disk)"
 mkfs.ext4 -q /dev/md0
 mkdir -p /data
 mount /dev/md0 /data
@@ -53,8 +63,10 @@ synchronise_clock
 ask healthy
 dmesg -c > /out/start.txt
 
-mdadm /dev/md0 --fail /dev/vdb --remove /dev/vdb
+qmp '{"execute":"device_del","arguments":{"id":"member"}}'
+await has_no_disk
 dd if=/dev/zero of=/data/full bs=1M 2> /out/dd.txt || :
+sync  # so that the mirror notices that the member is gone
 monitor 'set_link n0 off'
 sh -c 'echo $$ > /run/groups/small/cgroup.procs; exec tail /dev/zero' || :
 echo '0 2048 error' | dmsetup create --noudevsync broken
@@ -68,7 +80,10 @@ ask faults
 
 rm /data/full
 sync
-mdadm /dev/md0 --add /dev/vdb
+mdadm /dev/md0 --remove detached || mdadm /dev/md0 --remove failed
+qmp '{"execute":"device_add","arguments":{"driver":"scsi-hd","bus":"scsi.0","drive":"d1","id":"member"}}'
+await has_disk
+mdadm /dev/md0 --add "$(disk)"
 monitor 'set_link n0 on'
 dmsetup remove --noudevsync broken
 sensor_limit 80000

@@ -1,7 +1,7 @@
 #!/bin/sh
 # SPDX-License-Identifier: Apache-2.0
 #
-# Plants faults in a virtual machine: a pulled array member, a full file system, an unplugged cable, a process killed for lack of
+# Plants faults in a virtual machine: an array member that is pulled out while it is used, a full file system, an unplugged cable, a process killed for lack of
 # memory, a disk with errors, a machine check, a sensor beyond its threshold, and a clock that is not synchronised. zep must find
 # each with its remedy, nothing before, and nothing after they are mended.
 #
@@ -28,15 +28,16 @@ work=$(mktemp -d "${TMPDIR:-/tmp}/zep-faults.XXXXXX")
 trap 'rm -rf "$work"' EXIT
 
 devices="-M q35"
+truncate -s 64M "$work/disk0" "$work/disk1"
 for number in 0 1; do
-  truncate -s 64M "$work/disk$number"
-  devices="$devices -drive file=$work/disk$number,if=none,id=d$number,format=raw -device virtio-blk-pci,drive=d$number"
+  devices="$devices -blockdev driver=raw,node-name=d$number,file.driver=file,file.filename=$work/disk$number"
   devices="$devices -netdev user,id=n$number,restrict=on -device virtio-net-pci,netdev=n$number"
 done
+devices="$devices -device virtio-blk-pci,drive=d0 -device virtio-scsi-pci,id=scsi -device scsi-hd,bus=scsi.0,drive=d1,id=member"
 monitor="-chardev socket,id=monitor,path=$work/monitor,server=on,wait=off -mon chardev=monitor,mode=control"
 monitor="$monitor -chardev socket,id=serial,path=$work/monitor -serial chardev:serial"
 set --
-for module in virtio_pci virtio_blk virtio_net md-mod raid1 dm-mod ext4 bonding lm75; do set -- "$@" --module "$module"; done
+for module in virtio_pci virtio_blk virtio_scsi sd_mod virtio_net md-mod raid1 dm-mod ext4 bonding lm75; do set -- "$@" --module "$module"; done
 for program in perl mdadm dmsetup ip mkfs.ext4; do
   set -- "$@" --file "$(PATH=$PATH:/usr/sbin command -v "$program")"
 done
