@@ -97,6 +97,8 @@ function(zep_test name)
   endif()
   if(ZEP_SANITIZE MATCHES thread)  # makes some tests ten times slower
     math(EXPR ARG_TIMEOUT "10 * ${ARG_TIMEOUT}")
+  elseif(ZEP_SANITIZE)
+    math(EXPR ARG_TIMEOUT "4 * ${ARG_TIMEOUT}")
   endif()
   add_executable(${name} ${ARG_SOURCES})
   target_link_libraries(${name} PRIVATE test_support ${ARG_LIBS} GTest::gtest_main)

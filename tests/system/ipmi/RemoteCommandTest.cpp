@@ -244,7 +244,7 @@ TEST_F(ZepRemoteTest, AListOfAThousandHostsIsCompletedAlthoughSomeFail) {
   WriteFile(fDir.Path("hosts"), hosts);
   auto const start = TClock::now();
   zep::TRun const run = Run({"--hosts", fDir.Path("hosts"), "--parallel", "50"});
-  EXPECT_LT(SecondsSince(start), 60);
+  EXPECT_LT(SecondsSince(start), 180);  // one after the other would take a quarter of an hour
   EXPECT_EQ(run.fStatus, 2);
   EXPECT_EQ(run.fErrors, "zep: 1000 of 1000 hosts done, 110 failed\n");
   std::multiset<std::string> told, asked;
