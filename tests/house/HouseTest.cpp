@@ -259,6 +259,16 @@ TEST(HouseTest, EveryKeptBehaviourNamesAFileAndATestThatExist) {
   EXPECT_GT(rows, 20);
 }
 
+TEST(HouseTest, EveryTestThatTheSecurityPageNamesExists) {
+  static std::regex const named(R"(`(\w+Test\.\w+)`)");
+  std::set<std::string> const tests = AllTests();
+  std::string const page = ReadFile((kSource / "docs/security.md").string());
+  int count = 0;
+  for (std::sregex_iterator match(page.begin(), page.end(), named), end; match != end; ++match, ++count)
+    EXPECT_TRUE(tests.count((*match)[1])) << (*match)[1];
+  EXPECT_GT(count, 20);
+}
+
 std::string OutputOf(std::string const& command) {
   std::unique_ptr<FILE, int (*)(FILE*)> const pipe(::popen(command.c_str(), "r"), ::pclose);
   std::string output;
