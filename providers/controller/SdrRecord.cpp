@@ -4,6 +4,8 @@
 #include "IpmiText.h"
 #include "TBytes.h"
 
+#include <algorithm>
+
 namespace NQRVZEP20 {
 
 namespace {
@@ -71,10 +73,19 @@ TSdrSensor FullSensor(TBytes const& record) {
   return sensor;
 }
 
-TSdrSensor OtherSensor(TBytes const& record, TSdrSensor::EKind kind, std::size_t nameOffset) {
+TSdrSensor OtherSensor(TBytes const& record, TSdrSensor::EKind kind, std::size_t sharingOffset, std::size_t nameOffset) {
   TSdrSensor sensor = SensorOf(record, kind);
   sensor.fName = NameAt(record, nameOffset);
+  sensor.fSharers = std::max<std::uint8_t>(record.At(sharingOffset) & 0x0F, 1);
+  sensor.fHasLetters = (record.At(sharingOffset) & 0x30) == 0x10;
+  sensor.fOffset = record.At(sharingOffset + 1) & 0x7F;
   return sensor;
+}
+
+// 0 is "A", 25 is "Z", 26 is "AA".
+std::string LettersOf(unsigned number) {
+  std::string letters(1, static_cast<char>('A' + number % 26));
+  return number < 26 ? letters : LettersOf(number / 26 - 1) + letters;
 }
 
 TFruLocator FruLocatorOf(TBytes const& record) {
@@ -93,10 +104,10 @@ TSdrRecord SdrRecordFrom(std::string_view record) {
       if (IsAtLeast(bytes, 48)) return {FullSensor(bytes), {}};
       break;
     case kCompact:
-      if (IsAtLeast(bytes, 32)) return {OtherSensor(bytes, TSdrSensor::EKind::kCompact, 31), {}};
+      if (IsAtLeast(bytes, 32)) return {OtherSensor(bytes, TSdrSensor::EKind::kCompact, 23, 31), {}};
       break;
     case kEventOnly:
-      if (IsAtLeast(bytes, 17)) return {OtherSensor(bytes, TSdrSensor::EKind::kEventOnly, 16), {}};
+      if (IsAtLeast(bytes, 17)) return {OtherSensor(bytes, TSdrSensor::EKind::kEventOnly, 12, 16), {}};
       break;
     case kFruDevice:
       if (IsAtLeast(bytes, 16)) return {{}, FruLocatorOf(bytes)};
@@ -105,6 +116,19 @@ TSdrRecord SdrRecordFrom(std::string_view record) {
       break;
   }
   return {};
+}
+
+std::vector<TSdrSensor> SharersOf(TSdrSensor const& sensor) {
+  constexpr unsigned last = 0xFE;  // 0xFF is not the number of a sensor
+  if (sensor.fSharers == 1) return {sensor};
+  std::vector<TSdrSensor> sharers;
+  for (unsigned i = 0; i < sensor.fSharers && sensor.fNumber + i <= last; ++i) {
+    TSdrSensor& sharer = sharers.emplace_back(sensor);
+    sharer.fNumber = static_cast<std::uint8_t>(sensor.fNumber + i);
+    unsigned const place = sensor.fOffset + i;
+    if (sensor.fName) sharer.fName = *sensor.fName + " " + (sensor.fHasLetters ? LettersOf(place) : std::to_string(place));
+  }
+  return sharers;
 }
 
 }  // namespace NQRVZEP20

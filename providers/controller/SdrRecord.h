@@ -7,6 +7,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace NQRVZEP20 {
 
@@ -45,7 +46,14 @@ struct TSdrSensor {
   TSensorScale fScale = {};
   TRawThresholds fThresholds = {};  // as the repository has them
   TFinding<std::string> fName = TMissing{};
+  std::uint8_t fSharers = 1;  // sensors that the record describes, with numbers from fNumber on
+  bool fHasLetters = false;   // whether their names end in letters and not in numbers
+  std::uint8_t fOffset = 0;   // of the first number or letter
 };
+
+// The sensors that the record of this one describes. If there are several, the name of each ends in a number or letter of its
+// own: "DIMM 1", "DIMM 2".
+std::vector<TSdrSensor> SharersOf(TSdrSensor const& sensor);
 
 // A FRU device of the repository.
 struct TFruLocator {

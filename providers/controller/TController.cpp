@@ -23,12 +23,12 @@ void ReadSensors(TController& controller, TIpmi const& ipmi, std::vector<TSdrRec
   for (TSdrRecord const& record : records) {
     ++done;
     if (!record.fSensor) continue;
-    if (record.fSensor->fKind == TSdrSensor::EKind::kEventOnly) {
-      controller.fEventSensors.push_back(*record.fSensor);
-      continue;
-    }
-    controller.fSensors.push_back(ReadSensor(ipmi, *record.fSensor));
-    progress("sensors", done, records.size());
+    for (TSdrSensor const& sensor : SharersOf(*record.fSensor))
+      if (sensor.fKind == TSdrSensor::EKind::kEventOnly)
+        controller.fEventSensors.push_back(sensor);
+      else
+        controller.fSensors.push_back(ReadSensor(ipmi, sensor));
+    if (record.fSensor->fKind != TSdrSensor::EKind::kEventOnly) progress("sensors", done, records.size());
   }
 }
 

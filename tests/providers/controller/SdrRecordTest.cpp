@@ -70,6 +70,26 @@ TEST(SdrRecordTest, AnEventOnlySensorHasAName) {
   EXPECT_EQ(*sensor->fName, "Power On");
 }
 
+TEST(SdrRecordTest, SensorsThatShareARecordHaveNumbersAndNamesOfTheirOwn) {
+  auto const sharersOf = [](int number, int sharing, int offset) {
+    std::string record = CompactSensorRecord(1, number, 8, "PSU ");
+    record[23] = static_cast<char>(sharing);
+    record[24] = static_cast<char>(offset);
+    std::string text;
+    for (TSdrSensor const& sensor : SharersOf(*SdrRecordFrom(record).fSensor))
+      text += std::to_string(sensor.fNumber) + " " + *sensor.fName + ", ";
+    return text;
+  };
+  EXPECT_EQ(sharersOf(7, 0, 5), "7 PSU, ") << "one sensor";
+  EXPECT_EQ(sharersOf(7, 1, 5), "7 PSU, ") << "one sensor";
+  EXPECT_EQ(sharersOf(7, 3, 1), "7 PSU 1, 8 PSU 2, 9 PSU 3, ");
+  EXPECT_EQ(sharersOf(7, 0x13, 24), "7 PSU Y, 8 PSU Z, 9 PSU AA, ");
+  EXPECT_EQ(sharersOf(0xFE, 2, 0), "254 PSU 0, ") << "there is no sensor 255";
+  std::string events = EventOnlyRecord(1, 7, 0x12, "Slot ");
+  events[12] = 2;
+  EXPECT_EQ(SharersOf(*SdrRecordFrom(events).fSensor).size(), 2U);
+}
+
 TEST(SdrRecordTest, AFruDeviceIsLocated) {
   auto const fru = SdrRecordFrom(FruLocatorRecord(3, 5, "Riser")).fFru;
   ASSERT_TRUE(fru);
