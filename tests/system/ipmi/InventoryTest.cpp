@@ -222,6 +222,15 @@ TEST_F(InventoryTest, AControllerThatFallsSilentLeavesWhatWasReadInTime) {
       << "the records of the sensors, the event log, and the FRU data";
 }
 
+// It would describe the controller of this machine.
+TEST_F(InventoryTest, APlugInOfAnotherVersionIsRefused) {
+  std::filesystem::remove(fZep.Path("lib/libController.nsp.so"));
+  fZep.Add("libController.nsp.so", OLD_CONTROLLER_PLUGIN);
+  zep::TRun const run = Run({"127.0.0.1", "--inventory"});
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_THAT(run.fErrors, HasSubstr("inventory: libController.nsp.so did not use the session; install the version of zep"));
+}
+
 TEST_F(InventoryTest, WithoutThePlugInTheReasonIsGiven) {
   std::filesystem::remove(fZep.Path("lib/libController.nsp.so"));
   zep::TRun const run = Run({"127.0.0.1", "--inventory"});

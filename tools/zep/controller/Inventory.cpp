@@ -29,6 +29,7 @@ constexpr char kEnd = '\0';  // of the reason, which precedes the namespace
 // Of the session: when to stop, and whether a command was not answered by then.
 std::chrono::steady_clock::time_point gEnd;
 bool gIsWaiting = false;
+bool gIsUsed = false;  // whether the plug-in has sent a command over the session
 
 // The library waits for an answer as long as it likes, so that it does so in a thread of its own.
 std::optional<TIpmiAnswer> AnswerInTime(TIpmiCommand const& command) {
@@ -41,6 +42,7 @@ std::optional<TIpmiAnswer> AnswerInTime(TIpmiCommand const& command) {
 
 unsigned SendCommand(unsigned char netFn, unsigned char command, unsigned char const* data, unsigned dataLength,
                      unsigned char* answer) {
+  gIsUsed = true;
   if (gIsWaiting) return 0;
   auto const reply = AnswerInTime({netFn, command, {data, data + dataLength}});
   if (!reply || !reply->fIsAnswered) return 0;
@@ -69,7 +71,9 @@ boost::shared_ptr<ICIMNamespace> ReadController(std::string const& host, TInvent
   TZepController const controller = {host.c_str(), SendCommand, limits.fShowsProgress ? ShowProgress : nullptr,
                                      static_cast<unsigned>(limits.fTime.count())};
   TCIMContext const context = {{kZepControllerEntry, TCIMValue(reinterpret_cast<unsigned long>(&controller))}};
-  return TNamespaceProviderManager::GetInstance()->GetNamespaceProvider(kProvider)->GetNamespace(context);
+  auto const ns = TNamespaceProviderManager::GetInstance()->GetNamespaceProvider(kProvider)->GetNamespace(context);
+  if (!gIsUsed) throw std::runtime_error("libController.nsp.so did not use the session; install the version of zep");
+  return ns;
 }
 
 // The lists that were not read to their ends, or why there is no controller in the namespace.
