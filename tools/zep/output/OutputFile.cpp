@@ -3,6 +3,7 @@
 
 #include "core/Handles.h"
 #include "tools/zep/output/Failure.h"
+#include "tools/zep/processes/Interrupts.h"
 #include "tools/zep/processes/WriteWhole.h"
 
 #include <stdlib.h>
@@ -24,13 +25,15 @@ namespace {
 // The mode of the file that is replaced or, for a new one, that which the shell would give it.
 mode_t ModeFor(std::string const& file) {
   struct stat target {};
-  if (::lstat(file.c_str(), &target) == 0) {
-    if (!S_ISREG(target.st_mode)) Throw(file, "it is not a regular file");
-    return target.st_mode & 0777;
-  }
+  if (::lstat(file.c_str(), &target) == 0) return target.st_mode & 0777;
   mode_t const mask = ::umask(0);
   ::umask(mask);
   return 0666 & ~mask;
+}
+
+void RefuseUnlessRegular(std::string const& file) {
+  struct stat target {};
+  if (::lstat(file.c_str(), &target) == 0 && !S_ISREG(target.st_mode)) Throw(file, "it is not a regular file");
 }
 
 bool WriteAndRename(int draft, mode_t mode, std::string const& name, std::string const& file, std::string const& text) {
@@ -38,10 +41,8 @@ bool WriteAndRename(int draft, mode_t mode, std::string const& name, std::string
          std::rename(name.c_str(), file.c_str()) == 0;
 }
 
-}  // namespace
-
-void WriteOutputFile(std::string const& file, std::string const& text) {
-  mode_t const mode = ModeFor(file);
+void WriteFileWithMode(std::string const& file, std::string const& text, mode_t mode) {
+  TInterruptsBlocked const untilTheDraftIsGone;
   std::string name = file + ".XXXXXX";
   TUniqueFd const draft(::mkstemp(name.data()));
   if (!draft) Throw(file, std::strerror(errno));
@@ -49,6 +50,18 @@ void WriteOutputFile(std::string const& file, std::string const& text) {
   int const error = errno;
   ::unlink(name.c_str());
   Throw(file, std::strerror(error));
+}
+
+}  // namespace
+
+void WriteOutputFile(std::string const& file, std::string const& text) {
+  RefuseUnlessRegular(file);
+  WriteFileWithMode(file, text, ModeFor(file));
+}
+
+void WritePrivateFile(std::string const& file, std::string const& text) {
+  RefuseUnlessRegular(file);
+  WriteFileWithMode(file, text, S_IRUSR | S_IWUSR);
 }
 
 }  // namespace NQRVZEP20::zep

@@ -39,6 +39,15 @@ TEST(OutputFileTest, WritesAFileWithTheUsualModeAndReplacesItWithItsOwn) {
   EXPECT_EQ(FilesIn(dir.Path()), 1u);
 }
 
+TEST(OutputFileTest, APrivateFileIsOfItsOwnerAlsoIfItReplacesAnother) {
+  TTempDir const dir;
+  WriteFile(dir.Path("a"), "one");
+  fs::permissions(dir.Path("a"), fs::perms::all);
+  WritePrivateFile(dir.Path("a"), "two");
+  EXPECT_EQ(ReadFile(dir.Path("a")), "two");
+  EXPECT_EQ(static_cast<mode_t>(fs::status(dir.Path("a")).permissions()), 0600u);
+}
+
 TEST(OutputFileTest, APipeALinkAndADirectoryAreNotReplaced) {
   TTempDir const dir;
   fs::create_directory(dir.Path("d"));
