@@ -1,13 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/stored/StoredReport.h"
 
-#include "collect/SafeText.h"
 #include "collect/UnitText.h"
+#include "collect/stored/StoredDocument.h"
 #include "collect/stored/TStoredNode.h"
 
 #include <algorithm>
-#include <filesystem>
-#include <fstream>
+#include <charconv>
 #include <initializer_list>
 #include <string_view>
 
@@ -18,63 +17,7 @@ namespace {
 using TJson = TStoredNode::TJson;
 using TText = TAnswer<std::string>;
 
-constexpr int kVersion = 2;
-
-// ---- Parsing ----
-
-// Refuses what no report contains, before it costs memory or time: the library searches the members of an object one by one.
-class TBounds {
-public:
-  bool Check(int depth, TJson::parse_event_t event) {
-    constexpr int deepest = 16;
-    constexpr std::size_t mostMembers = 2000;
-    if (depth >= deepest) throw TStoredReportError("the document is nested too deeply for a report");
-    std::size_t& members = fMembers[depth];
-    if (event == TJson::parse_event_t::object_start) fMembers[depth + 1] = 0;
-    if (event == TJson::parse_event_t::key && ++members > mostMembers)
-      throw TStoredReportError("an object has more than " + std::to_string(mostMembers) + " members");
-    return true;
-  }
-
-private:
-  std::size_t fMembers[32] = {};
-};
-
-// "line 3, column 9: syntax error while parsing value - unexpected end of input": the message without the number of the exception
-// and without the text of the file, which may be a password.
-std::string WhyNotJson(TJson::exception const& failure) {
-  if (dynamic_cast<TJson::parse_error const*>(&failure) == nullptr) return "a number is too large";
-  std::string_view what = failure.what();
-  if (std::size_t const at = what.find("line "); at != what.npos) what.remove_prefix(at);
-  return Printable(what.substr(0, what.find("; last read")));
-}
-
-TJson Parsed(std::string const& text) {
-  constexpr std::string_view gzip = "\x1f\x8b";
-  if (text.compare(0, gzip.size(), gzip) == 0) throw TStoredReportError("it is compressed; gunzip it first");
-  TBounds bounds;
-  try {
-    return TJson::parse(text, [&](int depth, TJson::parse_event_t event, TJson&) { return bounds.Check(depth, event); });
-  } catch (TJson::exception const& failure) {
-    throw TStoredReportError(WhyNotJson(failure));
-  }
-}
-
 // ---- The parts of the document ----
-
-void CheckHead(TStoredNode const& document) {
-  auto const name = document.Optional("document");
-  if (!name || !name->IsString() || name->Text() != "zep report")
-    throw TStoredReportError("it is not a document of zep report --json");
-  TStoredNode const version = document.Member("version");
-  if (!version.Json().is_number_unsigned()) version.Refuse("is not a number");
-  auto const number = version.Json().get<std::uint64_t>();
-  if (number != kVersion)
-    version.Refuse("is " + std::to_string(number) +
-                   (number > kVersion ? ", which a newer zep wrote" : ", which an older zep wrote") +
-                   "; this zep reads version " + std::to_string(kVersion));
-  if (!document.Optional("status")) throw TStoredReportError("it has no report: " + document.TextOrNullOf("reason"));
-}
 
 TMissing MissingOf(TStoredNode const& node) { return {node.TextOf("code"), node.TextOf("reason")}; }
 
@@ -137,27 +80,35 @@ void AddProviders(TStoredNode const& plugIn, std::vector<TStoredProvider>& provi
 
 // ---- Instances ----
 
-// A value that is not an array, as text.
-std::string TextOf(TStoredNode const& node) {
+// The shortest text that is read back as the same number.
+std::string ShortestOf(float number) {
+  char text[32];
+  return {text, std::to_chars(std::begin(text), std::end(text), number).ptr};
+}
+
+// A value that is not an array, as text. A real32 is written in the document with the digits of a real64.
+std::string TextOf(TStoredNode const& node, std::string const& type) {
   TJson const& json = node.Json();
   if (json.is_structured()) node.Refuse("is not a value");
+  if (json.is_number_float() && type.rfind("real32", 0) == 0) return ShortestOf(json.get<float>());
   return json.is_string() ? json.get<std::string>() : json.dump();
 }
 
 // The word for the value, or the value with its unit.
-std::string InWords(TStoredNode const& value, TJson const* word, std::string const& unit) {
-  std::string const text = TextOf(value);
+std::string InWords(TStoredNode const& value, TJson const* word, TStoredProperty const& property) {
+  std::string const text = TextOf(value, property.fType);
+  std::string const& unit = property.fUnit;
   if (word != nullptr && word->is_string()) return word->get<std::string>();
   return unit.empty() ? text : TextWithUnit(TCIMValue(text), unit);
 }
 
-std::string InWords(TStoredNode const& value, std::optional<TStoredNode> const& words, std::string const& unit) {
-  if (!value.IsArray()) return InWords(value, words ? &words->Json() : nullptr, unit);
+std::string InWords(TStoredNode const& value, std::optional<TStoredNode> const& words, TStoredProperty const& property) {
+  if (!value.IsArray()) return InWords(value, words ? &words->Json() : nullptr, property);
   std::string text;
   std::size_t at = 0;
   value.ForEachElement([&](TStoredNode const& element) {
     bool const hasWord = words && words->IsArray() && at < words->Json().size();
-    text += (at == 0 ? "" : ", ") + InWords(element, hasWord ? &words->Json()[at] : nullptr, unit);
+    text += (at == 0 ? "" : ", ") + InWords(element, hasWord ? &words->Json()[at] : nullptr, property);
     ++at;
   });
   return text;
@@ -172,8 +123,9 @@ TStoredProperty PropertyOf(TStoredNode const& node) {
     property.fMissing = MissingOf(node);
     return property;
   }
-  property.fText = InWords(value, node.Optional("words"), property.fUnit);
-  property.fRaw = value.IsArray() ? value.Json().dump(-1, ' ', false, TJson::error_handler_t::replace) : TextOf(value);
+  property.fText = InWords(value, node.Optional("words"), property);
+  property.fRaw =
+      value.IsArray() ? value.Json().dump(-1, ' ', false, TJson::error_handler_t::replace) : TextOf(value, property.fType);
   return property;
 }
 
@@ -193,7 +145,6 @@ void AddFailureOfInstances(TStoredNode const& failure, std::vector<TStoredProvid
 }
 
 TStoredReport ReportOf(TStoredNode const& document) {
-  CheckHead(document);
   TStoredReport report;
   report.fZep = document.TextOf("zep");
   if (auto const label = document.Optional("label")) report.fLabel = label->Text();
@@ -214,22 +165,6 @@ TStoredReport ReportOf(TStoredNode const& document) {
   return report;
 }
 
-std::string ReadWithinLimit(std::string const& file) {
-  std::error_code error;
-  if (!std::filesystem::exists(file, error)) throw TStoredReportError(error ? error.message() : "no such file");
-  if (!std::filesystem::is_regular_file(file, error)) throw TStoredReportError("it is not a regular file");
-  std::ifstream stream(file, std::ios::binary);
-  std::string text(
-      static_cast<std::size_t>(std::min<std::uintmax_t>(std::filesystem::file_size(file, error), kStoredReportLimit) + 1), '\0');
-  stream.read(text.data(), static_cast<std::streamsize>(text.size()));
-  text.resize(static_cast<std::size_t>(stream.gcount()));
-  if (text.size() > kStoredReportLimit)
-    throw TStoredReportError("it is longer than " + std::to_string(kStoredReportLimit >> 20) +
-                             " MiB, the limit for a stored report");
-  if (stream.bad() || !stream.eof()) throw TStoredReportError("it cannot be read");
-  return text;
-}
-
 }  // namespace
 
 TStoredProperty const* TStoredInstance::Find(std::string const& name) const {
@@ -247,9 +182,8 @@ bool TStoredInstance::IsAssociation() const {
   return hasKey;
 }
 
-TStoredReport StoredReportFrom(std::string const& text, std::string const& name) {
+TStoredReport StoredReportOf(TStoredDocument const& document, std::string const& name) {
   try {
-    TJson const document = Parsed(text);
     TStoredReport report = ReportOf(TStoredNode(document));
     report.fFile = name;
     return report;
@@ -258,14 +192,10 @@ TStoredReport StoredReportFrom(std::string const& text, std::string const& name)
   }
 }
 
-TStoredReport ReadStoredReport(std::string const& file) {
-  std::string text;
-  try {
-    text = ReadWithinLimit(file);
-  } catch (TStoredReportError const& failure) {
-    throw TStoredReportError(file + ": " + failure.what());
-  }
-  return StoredReportFrom(text, file);
+TStoredReport StoredReportFrom(std::string const& text, std::string const& name) {
+  return StoredReportOf(StoredDocumentFrom(text, name), name);
 }
+
+TStoredReport ReadStoredReport(std::string const& file) { return StoredReportOf(ReadStoredDocument(file), file); }
 
 }  // namespace NQRVZEP20

@@ -77,6 +77,12 @@ TEST(StoredReportTest, ValuesHaveWordsAndUnits) {
   EXPECT_EQ(report.fInstances.at(1).Find("Capacity")->fMissing.fReason, "the firmware gives none");
 }
 
+// The document has the digits of a double.
+TEST(StoredReportTest, AReal32HasItsShortestText) {
+  TStoredReport const report = StoredReportFrom(StoredDocumentWith("1.25", "3.299999952316284"), "a.json");
+  EXPECT_EQ(report.fInstances[0].Find("Voltage")->fText, "3.3");
+}
+
 TEST(StoredReportTest, AnInstanceWhoseKeysAreReferencesIsAnAssociation) {
   TStoredReport const report = StoredReportFrom(StoredDocument(), "a.json");
   EXPECT_FALSE(report.fInstances.at(0).IsAssociation());
@@ -123,6 +129,8 @@ TEST(StoredReportTest, ForeignBytesAreRefused) {
   EXPECT_EQ(WhyTextRefused("\"secret\n"),
             "a.json: line 2, column 0: syntax error while parsing value - invalid string: control character U+000A (LF) must be "
             "escaped to \\u000A or \\n");
+  EXPECT_EQ(WhyTextRefused("{\"document\":\"zep report\",\"version\":2}\n{\"path\":\"x\"}\n"),
+            "a.json: it has a line for each instance; this command reads the document of zep report --json");
   EXPECT_EQ(WhyTextRefused("{\"x\":1e999}"), "a.json: a number is too large");
   EXPECT_EQ(WhyTextRefused("[]"), "a.json: the document is not an object");
   EXPECT_EQ(WhyTextRefused("{}"), "a.json: it is not a document of zep report --json");

@@ -1,0 +1,83 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/redaction/DocumentTexts.h"
+
+#include <algorithm>
+#include <unordered_set>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+using TJson = nlohmann::ordered_json;
+
+// Members whose texts zep or a class defines.
+constexpr std::string_view kNames[] = {"class", "classes",  "code",      "columns", "document",     "id",         "key",
+                                       "label", "name",     "namespace", "outcome", "provider",     "question",   "redaction",
+                                       "rule",  "severity", "stage",     "status",  "superclasses", "thresholds", "time",
+                                       "title", "type",     "unit",      "worst",   "zep"};
+
+bool IsName(std::string_view member, TJson const& value) {
+  bool const isText = value.is_string() || value.is_array() || member == "thresholds" || member == "redaction";
+  return isText && std::binary_search(std::begin(kNames), std::end(kNames), member);
+}
+
+// Whether the object is a property whose value is a number or a time, perhaps as a text.
+bool IsNumber(TJson const& object) {
+  auto const type = object.find("type");
+  if (type == object.end() || !type->is_string()) return false;
+  auto const& name = type->get_ref<std::string const&>();
+  for (char const* number : {"uint", "sint", "real", "boolean", "datetime"})
+    if (name.rfind(number, 0) == 0) return true;
+  return false;
+}
+
+class TTextWriter {
+public:
+  TTextWriter(TJson const& document, TUseText const& use) : fUse(use) {
+    auto const instances = document.find("instances");
+    if (instances == document.end() || !instances->is_array()) return;
+    for (TJson const& instance : *instances)
+      if (instance.is_object()) fNamespaces.insert(instance.value("namespace", ""));
+  }
+
+  void Rewrite(TJson& json, TPlace const& place) {
+    if (json.is_string()) RewriteText(json.get_ref<std::string&>(), place);
+    if (json.is_array()) RewriteElements(json, place);
+    if (json.is_object()) RewriteMembers(json, place);
+  }
+
+private:
+  void RewriteText(std::string& text, TPlace const& place) {
+    std::size_t const begin = BeginOfKeys(text);
+    if (auto const rewritten = fUse(std::string_view(text).substr(begin), place)) text.replace(begin, text.npos, *rewritten);
+  }
+
+  void RewriteElements(TJson& array, TPlace const& place) {
+    std::size_t at = 0;
+    for (TJson& element : array) Rewrite(element, TPlace(&place, std::to_string(at++)));
+  }
+
+  void RewriteMembers(TJson& object, TPlace const& place) {
+    bool const isNumber = IsNumber(object);
+    for (auto& [name, value] : object.get_ref<TJson::object_t&>())
+      if (!IsName(name, value) && !(isNumber && name == "value")) Rewrite(value, TPlace(&place, name));
+  }
+
+  // The size of the namespace and the class with which an object path begins; 0 of any other text.
+  std::size_t BeginOfKeys(std::string const& text) const {
+    std::size_t const colon = text.find(':');
+    if (colon == text.npos || fNamespaces.count(text.substr(0, colon)) == 0) return 0;
+    return std::min(text.find_first_of(".#", colon), text.size());
+  }
+
+  TUseText const& fUse;
+  std::unordered_set<std::string> fNamespaces;
+};
+
+}  // namespace
+
+void RewriteTexts(nlohmann::ordered_json& document, TUseText const& use) {
+  TTextWriter(document, use).Rewrite(document, TPlace(nullptr, ""));
+}
+
+}  // namespace NQRVZEP20

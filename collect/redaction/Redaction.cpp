@@ -1,0 +1,154 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/redaction/Redaction.h"
+
+#include "collect/redaction/DocumentTexts.h"
+#include "collect/redaction/SecretProperties.h"
+#include "collect/redaction/TSecretIndex.h"
+#include "collect/redaction/Texts.h"
+
+#include <algorithm>
+#include <optional>
+#include <unordered_map>
+
+namespace NQRVZEP20 {
+
+namespace {
+
+using TJson = nlohmann::ordered_json;
+using TKinds = std::vector<ESecretKind>;
+
+constexpr char const* kRedaction = "redaction";
+
+bool IsIn(TKinds const& kinds, ESecretKind kind) { return std::find(kinds.begin(), kinds.end(), kind) != kinds.end(); }
+
+// Whether the member of a document is a message of a plug-in, the kernel or zep.
+bool IsMessage(std::string_view member) {
+  return member == "reason" || member == "error" || member == "lastLogLine" || member == "words" || member == "note";
+}
+
+// Collects the secrets of a document.
+class TCollector {
+public:
+  TCollector(TSecretIndex& index, TKinds kinds) : fIndex(index), fKinds(std::move(kinds)) {}
+
+  void Collect(TJson& document) {
+    if (auto const classes = document.find("classes"); classes != document.end()) ReadClasses(*classes);
+    for (char const* rows : {"identity", "details"}) CollectRows(document[rows]);
+    for (TJson const& instance : document["instances"]) CollectInstance(instance);
+    RewriteTexts(document, [&](std::string_view text, TPlace const& place) {
+      CollectShapes(text, IsMessage(place.Name()));
+      return std::nullopt;
+    });
+  }
+
+private:
+  void ReadClasses(TJson const& classes) {
+    for (TJson const& row : classes) fClasses[row.value("class", "")] = row.value("superclasses", std::vector<std::string>());
+  }
+
+  // The class and its superclasses. A document without the member "classes" has only the class.
+  std::vector<std::string> const& LineOf(std::string const& name) {
+    auto& line = fClasses[name];
+    if (line.empty() || line.front() != name) line.insert(line.begin(), name);
+    return line;
+  }
+
+  void CollectRows(TJson const& rows) {
+    for (auto const& [key, row] : rows.get_ref<TJson::object_t const&>())
+      if (auto const kind = KindOfRow(key)) AddAll(*kind, row["value"]);
+  }
+
+  void CollectInstance(TJson const& instance) {
+    auto const& classes = LineOf(instance["class"].get_ref<std::string const&>());
+    TJson const& properties = instance["properties"];
+    for (auto const& [name, property] : properties.get_ref<TJson::object_t const&>()) {
+      TJson const& value = property["value"];
+      if (auto const kind = KindOfProperty(classes, name)) AddAll(*kind, value);
+      if (name == "OtherIdentifyingInfo") CollectDescribed(properties, value);
+      if (IsFreeText(name)) ForEachString(value, [&](std::string const& text) { CollectShapes(text, true); });
+    }
+  }
+
+  // The elements of OtherIdentifyingInfo that IdentifyingDescriptions calls a serial number.
+  void CollectDescribed(TJson const& properties, TJson const& values) {
+    auto const found = properties.find("IdentifyingDescriptions");
+    if (found == properties.end() || !values.is_array()) return;
+    TJson const& descriptions = (*found)["value"];
+    for (std::size_t at = 0; at < std::min(values.size(), descriptions.size()); ++at)
+      if (values[at].is_string() && descriptions[at].is_string() &&
+          DescribesSerial(descriptions[at].get_ref<std::string const&>()))
+        Add(ESecretKind::kSerials, values[at].get<std::string>());
+  }
+
+  void CollectShapes(std::string_view text, bool withIPv4) {
+    for (std::string const& address : AddressesIn(text, withIPv4)) Add(ESecretKind::kAddresses, address);
+    for (std::string const& user : HomesIn(text)) Add(ESecretKind::kUsers, user);
+  }
+
+  template <class TUse>
+  static void ForEachString(TJson const& value, TUse use) {
+    if (value.is_string()) use(value.get_ref<std::string const&>());
+    if (value.is_array())
+      for (TJson const& element : value) ForEachString(element, use);
+  }
+
+  void AddAll(ESecretKind kind, TJson const& value) {
+    ForEachString(value, [&](std::string const& text) { AddTyped(kind, text); });
+  }
+
+  // The name of a host may be its address, and the access information of a service a name.
+  void AddTyped(ESecretKind kind, std::string const& value) {
+    std::string const text = value.substr(0, kind == ESecretKind::kAddresses ? value.find_first_of("/%") : value.npos);
+    bool const isAddress = IsIPv4(text) || IsIPv6(text) || IsMac(text);
+    if (kind == ESecretKind::kHosts && isAddress) return Add(ESecretKind::kAddresses, text);
+    Add(kind, text);
+    bool const hasDomain = kind == ESecretKind::kHosts && !isAddress && text.find('.') != text.npos;
+    if (hasDomain && text.front() != '.') Add(kind, text.substr(0, text.find('.')));
+  }
+
+  void Add(ESecretKind kind, std::string const& value) {
+    if (IsIn(fKinds, kind)) fIndex.Add(kind, value);
+  }
+
+  TSecretIndex& fIndex;
+  TKinds fKinds;
+  std::unordered_map<std::string, std::vector<std::string>> fClasses;
+};
+
+}  // namespace
+
+TSecretCounts CountSecrets(TJson document) {
+  TSecretIndex index;
+  TCollector(index, {kSecretKinds.begin(), kSecretKinds.end()}).Collect(document);
+  return index.Counts();
+}
+
+bool IsRedacted(TJson const& document) { return document.contains(kRedaction); }
+
+void Redact(TJson& document, TKinds const& kinds, TPseudonyms& pseudonyms) {
+  TSecretIndex index;
+  for (TSecret const& secret : pseudonyms.Secrets())
+    if (IsIn(kinds, secret.fKind)) index.Add(secret.fKind, secret.fValue);
+  TCollector(index, kinds).Collect(document);
+  auto const replace = [&](TSecret const* secret, std::string const& spelling) { return pseudonyms.For(secret, spelling); };
+  RewriteTexts(document, [&](std::string_view text, TPlace const&) { return index.Rewritten(text, replace); });
+  TJson names = TJson::array();
+  for (ESecretKind const kind : kinds) names.push_back(NameOf(kind));
+  document[kRedaction] = {{"kinds", names}, {"map", pseudonyms.Id()}};
+}
+
+void Unredact(TJson& document, TPseudonyms const& pseudonyms) {
+  if (!IsRedacted(document)) throw TRedactionError("it is not redacted");
+  if (document[kRedaction].value("map", "") != pseudonyms.Id()) throw TRedactionError("it was redacted with another map");
+  document.erase(kRedaction);
+  TSecretIndex const none;
+  RewriteTexts(document, [&](std::string_view text, TPlace const& place) {
+    return none.Rewritten(text, [&](TSecret const*, std::string const& pseudonym) {
+      std::string const* const spelling = pseudonyms.SpellingOf(pseudonym);
+      if (spelling == nullptr) throw TRedactionError(place.AsText() + ": " + pseudonym + " is not in the map");
+      return *spelling;
+    });
+  });
+}
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,46 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <cstddef>
+#include <functional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace NQRVZEP20 {
+
+// Words of texts. A word is a run of ASCII letters, digits, and bytes of other UTF-8 characters.
+
+inline bool IsWordByte(char byte) {
+  return (byte >= '0' && byte <= '9') || (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z') ||
+         static_cast<unsigned char>(byte) >= 0x80;
+}
+
+inline char Lower(char byte) { return byte >= 'A' && byte <= 'Z' ? static_cast<char>(byte - 'A' + 'a') : byte; }
+std::string Lower(std::string_view text);
+
+// Whether it consists of hexadecimal digits; an empty text does not.
+bool IsHex(std::string_view text);
+
+// The bytes of words alone: "525400112201" for "52:54:00:11:22:01".
+std::string Compact(std::string_view text);
+
+// The end of the word that begins at `at`, or `at` if none does.
+std::size_t EndOfWord(std::string_view text, std::size_t at);
+
+// Whether no word continues across this place: at the begin, at the end, and at a byte that belongs to no word.
+bool IsWordBound(std::string_view text, std::size_t begin, std::size_t end);
+
+// Whether the text is an IPv4 or IPv6 address, or a MAC address with colons or hyphens.
+bool IsIPv4(std::string_view text);
+bool IsIPv6(std::string_view text);
+bool IsMac(std::string_view text);
+
+// The addresses in a text, each as it is written there: MAC and IPv6 addresses, and if `withIPv4`, which looks like a version,
+// IPv4 addresses, too.
+std::vector<std::string> AddressesIn(std::string_view text, bool withIPv4);
+
+// The names of home directories in a text: "alice" for "/home/alice/bin".
+std::vector<std::string> HomesIn(std::string_view text);
+
+}  // namespace NQRVZEP20

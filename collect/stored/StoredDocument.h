@@ -1,0 +1,31 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "collect/stored/StoredReport.h"
+
+#include <nlohmann/json.hpp>
+
+#include <string>
+
+namespace NQRVZEP20 {
+
+// A document of `zep report --json` as it was written: all members, in their order.
+using TStoredDocument = nlohmann::ordered_json;
+
+// The version of the documents that this library reads.
+constexpr int kStoredVersion = 2;
+
+// Parses a document and checks that it is one of a report, in that version; its parts are checked by StoredReportOf. Throws
+// TStoredReportError.
+TStoredDocument StoredDocumentFrom(std::string const& text, std::string const& name);
+
+// The text of a regular file of no more than kStoredReportLimit bytes. Throws TStoredReportError.
+std::string ReadStoredText(std::string const& file);
+
+// The document in such a file.
+TStoredDocument ReadStoredDocument(std::string const& file);
+
+// The report of a document. Throws TStoredReportError if a part of it is missing or of another kind.
+TStoredReport StoredReportOf(TStoredDocument const& document, std::string const& name);
+
+}  // namespace NQRVZEP20

@@ -1,0 +1,196 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "collect/redaction/Redaction.h"
+
+#include "collect/stored/StoredDocument.h"
+#include "tests/collect/stored/StoredDocument.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace NQRVZEP20 {
+namespace {
+
+using TJson = nlohmann::ordered_json;
+
+std::vector<ESecretKind> AllKinds() { return {kSecretKinds.begin(), kSecretKinds.end()}; }
+
+TJson PropertyOf(std::string const& type, TJson const& value) { return {{"type", type}, {"value", value}, {"source", "test"}}; }
+
+TJson InstanceOf(std::string const& className, TJson const& properties) {
+  return {{"path", "root/x:" + className + ".Tag=\"1\""},
+          {"provider", "X"},
+          {"namespace", "root/x"},
+          {"class", className},
+          {"properties", properties}};
+}
+
+// A document with one instance more.
+TJson DocumentWith(TJson const& instance) {
+  TJson document = TJson::parse(StoredDocument());
+  document["instances"].push_back(instance);
+  return document;
+}
+
+TJson DocumentWith(std::string const& property, TJson const& value) {
+  return DocumentWith(InstanceOf("X_Thing", {{property, PropertyOf(value.is_array() ? "string[]" : "string", value)}}));
+}
+
+std::string Redacted(TJson document, std::vector<ESecretKind> const& kinds = AllKinds()) {
+  TPseudonyms pseudonyms("1");
+  Redact(document, kinds, pseudonyms);
+  return document.dump();
+}
+
+TEST(RedactionTest, ThePropertyDecidesAndItsValueIsReplacedEverywhere) {
+  TJson document = DocumentWith("SerialNumber", "ZX81-77");
+  document["head"][0] = "the machine with the number zx81-77, also /dev/disk/by-id/x_ZX81-77-part1";
+  std::string const text = Redacted(document);
+  EXPECT_THAT(text, testing::Not(testing::HasSubstr("ZX81")));
+  EXPECT_THAT(text, testing::HasSubstr("the machine with the number serial-"));
+  EXPECT_THAT(text, testing::ContainsRegex("by-id/x_serial-[0-9]+-part1"));
+}
+
+TEST(RedactionTest, EachKindOfPropertyHasItsPseudonym) {
+  struct TRow {
+    char const *fProperty, *fValue, *fPseudonym;
+  };
+  TRow const rows[] = {
+      {"UUID", "3F2A9C54-11D0-4B8E-9A7E-52540011AA01", "serial-"},
+      {"AssetTag", "RACK5-C", "serial-"},
+      {"SystemName", "build7.example.net", "host-"},
+      {"SearchDomains", "lab.example.net", "host-"},
+      {"PermanentAddress", "525400112202", "address-"},
+      {"IPv4Address", "192.0.2.77", "address-"},
+      {"IPv6Address", "2001:db8::77", "address-"},
+      {"AccessInfo", "192.0.2.78", ""},
+      {"UserID", "mallory", "user-"},
+      {"SystemName", "192.0.2.79", "address-"},
+      {"Colour", "ZX81-77", ""},
+  };
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.fProperty);
+    std::string const text = Redacted(DocumentWith(row.fProperty, row.fValue));
+    bool const isSecret = *row.fPseudonym != '\0';
+    EXPECT_EQ(text.find(row.fValue) == text.npos, isSecret);
+    if (isSecret) {
+      EXPECT_THAT(text, testing::HasSubstr(std::string("\"value\":\"") + row.fPseudonym));
+    }
+  }
+}
+
+TEST(RedactionTest, AClassInheritsThePropertiesOfItsSuperclasses) {
+  TJson document = DocumentWith(InstanceOf("X_Rack", {{"Name", PropertyOf("string", "rack-row-9")}}));
+  EXPECT_THAT(Redacted(document), testing::HasSubstr("rack-row-9"));
+  document["classes"] = TJson::array({{{"class", "X_Rack"}, {"superclasses", {"X_Base", "CIM_System"}}}});
+  EXPECT_THAT(Redacted(document), testing::Not(testing::HasSubstr("rack-row-9")));
+}
+
+TEST(RedactionTest, ADescriptionMakesIdentifyingInfoASerialNumber) {
+  std::string const text = Redacted(
+      DocumentWith(InstanceOf("X_Disk", {{"OtherIdentifyingInfo", PropertyOf("string[]", {"QM-0001", "QEMU DISK"})},
+                                         {"IdentifyingDescriptions", PropertyOf("string[]", {"Serial number", "Product"})}})));
+  EXPECT_THAT(text, testing::Not(testing::HasSubstr("QM-0001")));
+  EXPECT_THAT(text, testing::HasSubstr("QEMU DISK"));
+}
+
+TEST(RedactionTest, PlaceholdersRemain) {
+  for (char const* value : {"Not Specified", "To Be Filled By O.E.M.", "0", "00000000", "XXXXXXX", "x", "0000:00:1f.2", ""}) {
+    std::string const text = Redacted(DocumentWith("SerialNumber", value));
+    EXPECT_THAT(text, testing::HasSubstr("\"value\":\"" + std::string(value) + "\"")) << value;
+  }
+  for (char const* value : {"127.0.0.1", "::1", "0.0.0.0", "255.255.255.0", "::"})
+    EXPECT_THAT(Redacted(DocumentWith("IPAddress", value)), testing::HasSubstr("\"value\":\"" + std::string(value) + "\""))
+        << value;
+  EXPECT_THAT(Redacted(DocumentWith("UserID", "root")), testing::HasSubstr("\"value\":\"root\""));
+}
+
+TEST(RedactionTest, OnlyTheKindsThatAreWantedAreReplaced) {
+  TJson const document = DocumentWith(
+      InstanceOf("X_Thing", {{"SerialNumber", PropertyOf("string", "ZX81-77")}, {"UserID", PropertyOf("string", "mallory")}}));
+  std::string const text = Redacted(document, {ESecretKind::kUsers});
+  EXPECT_THAT(text, testing::HasSubstr("ZX81-77"));
+  EXPECT_THAT(text, testing::Not(testing::HasSubstr("mallory")));
+  EXPECT_THAT(text, testing::HasSubstr(R"("redaction":{"kinds":["users"],"map":"1"})"));
+}
+
+TEST(RedactionTest, AddressesInFreeTextAreFoundByTheirShape) {
+  TJson const document = DocumentWith(InstanceOf(
+      "X_Log",
+      {{"Message", PropertyOf("string", "eth0: martian source 198.51.100.7 from 52:54:00:ab:cd:ef, fe80::9, at 10:20:30")},
+       {"Version", PropertyOf("string", "198.51.100.8")}}));
+  std::string const text = Redacted(document);
+  EXPECT_THAT(text, testing::ContainsRegex("source address-[0-9]+ from address-[0-9]+, address-[0-9]+, at 10:20:30"));
+  EXPECT_THAT(text, testing::HasSubstr("198.51.100.8")) << "may be a version";
+}
+
+TEST(RedactionTest, AUserIsFoundByTheHomeDirectory) {
+  TJson document = TJson::parse(StoredDocument());
+  document["plugInDirectory"] = "/home/mallory/zep/lib";
+  EXPECT_THAT(Redacted(document), testing::HasSubstr("/home/user-1/zep/lib"));
+}
+
+TEST(RedactionTest, NamesOfClassesAndNamespacesRemain) {
+  std::string const text = Redacted(DocumentWith("SystemName", "root"));
+  EXPECT_THAT(text, testing::HasSubstr("\"namespace\":\"root/x\""));
+  EXPECT_THAT(text, testing::HasSubstr("root/x:X_Thing.Tag"));
+}
+
+TEST(RedactionTest, NumbersAndTimesRemain) {
+  TJson const document = DocumentWith(
+      InstanceOf("X_Thing", {{"SerialNumber", PropertyOf("string", "123987")}, {"Size", PropertyOf("uint64", "123987")}}));
+  EXPECT_THAT(Redacted(document), testing::HasSubstr(R"("type":"uint64","value":"123987")"));
+}
+
+TEST(RedactionTest, TheOriginalIsGivenBackByteForByte) {
+  TJson document = DocumentWith("SerialNumber", "ZX81-77");
+  document["head"] = {"zx81-77 and ZX81_77 and xxZX81-77, text-1 and serial-1, host-2b", "5a583831 5a5838312d3737 enxZX8177"};
+  std::string const original = document.dump();
+  TPseudonyms pseudonyms("1");
+  Redact(document, AllKinds(), pseudonyms);
+  EXPECT_NE(document.dump(), original);
+  Unredact(document, TPseudonyms::From(pseudonyms.AsJson()));
+  EXPECT_EQ(document.dump(), original);
+}
+
+TEST(RedactionTest, TheSameMapGivesTheSamePseudonyms) {
+  TPseudonyms pseudonyms("1");
+  TJson first = DocumentWith("SerialNumber", "ZX81-77"), second = first;
+  Redact(first, AllKinds(), pseudonyms);
+  TJson other = DocumentWith("SerialNumber", "ZX81-78");
+  Redact(other, AllKinds(), pseudonyms);
+  TPseudonyms again = TPseudonyms::From(pseudonyms.AsJson());
+  Redact(second, AllKinds(), again);
+  EXPECT_EQ(first.dump(), second.dump());
+  EXPECT_EQ(pseudonyms.AsJson().dump(), again.AsJson().dump());
+}
+
+TEST(RedactionTest, AnotherMapAndAnUnknownPseudonymAreRefusedByPlace) {
+  auto const whyRefused = [](TJson document, TPseudonyms const& pseudonyms) -> std::string {
+    try {
+      Unredact(document, pseudonyms);
+    } catch (TRedactionError const& failure) {
+      return failure.what();
+    }
+    return "";
+  };
+  TPseudonyms pseudonyms("1");
+  TJson document = DocumentWith("SerialNumber", "ZX81-77");
+  EXPECT_EQ(whyRefused(document, pseudonyms), "it is not redacted");
+  Redact(document, AllKinds(), pseudonyms);
+  EXPECT_EQ(whyRefused(document, TPseudonyms("2")), "it was redacted with another map");
+  document["head"][1] = "see serial-99";
+  EXPECT_EQ(whyRefused(document, pseudonyms), "/head/1: serial-99 is not in the map");
+}
+
+TEST(RedactionTest, CountsTheSecretsOfEachKind) {
+  TJson const before = TJson::parse(StoredDocument());
+  TSecretCounts counts = CountSecrets(before);
+  ++counts[0];
+  ++counts[3];
+  TJson const document = DocumentWith(
+      InstanceOf("X_Thing", {{"SerialNumber", PropertyOf("string", "ZX81-77")}, {"UserID", PropertyOf("string", "mallory")}}));
+  EXPECT_EQ(CountSecrets(document), counts);
+}
+
+}  // namespace
+}  // namespace NQRVZEP20
