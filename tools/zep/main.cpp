@@ -49,6 +49,7 @@ constexpr TCommand kCommands[] = {
     {"send", "Send a file to an FTP or SFTP server", AddSendArguments},
     {"get", "Fetch a file from an FTP or SFTP server", AddGetArguments},
     {"proxy-check", "Check whether a web proxy lets requests through", AddProxyCheckArguments},
+    {"unredact", "Print the original of a redacted report", AddUnredactArguments},
     {"wpad", "Find the proxy configuration file that the DHCP server names", AddWpadArguments},
     {"help", "List the commands, or describe one", AddHelpArguments},
 };
@@ -91,10 +92,11 @@ CLI::App const& ChosenOf(CLI::App const& app) {
   return chosen.empty() ? app : ChosenOf(*chosen.front());
 }
 
+// An option that needs no value, such as --redact, has an empty one without it.
 void CheckForEmpty(CLI::App const& app) {
   for (CLI::Option const* const option : app.get_options())
     for (std::string const& value : option->results())
-      if (value.empty()) throw TWrongUsage(option->get_name() + kIsEmpty);
+      if (value.empty() && option->get_expected_min() > 0) throw TWrongUsage(option->get_name() + kIsEmpty);
   for (CLI::App const* const chosen : app.get_subcommands()) CheckForEmpty(*chosen);
 }
 

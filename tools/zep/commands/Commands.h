@@ -44,6 +44,7 @@ TRun AddReportArguments(CLI::App& command);      // ReportCommand.cpp
 TRun AddRunArguments(CLI::App& command);         // RunCommand.cpp
 TRun AddSendArguments(CLI::App& command);        // SendCommand.cpp
 TRun AddShowArguments(CLI::App& command);        // ShowCommand.cpp
+TRun AddUnredactArguments(CLI::App& command);    // UnredactCommand.cpp
 TRun AddWpadArguments(CLI::App& command);        // WpadCommand.cpp
 
 // The subcommand of that name, which `app` owns, or null (HelpCommand.cpp).

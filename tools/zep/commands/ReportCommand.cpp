@@ -3,14 +3,19 @@
 // zep report: which machine this is.
 
 #include "collect/Report.h"
+#include "collect/redaction/Redaction.h"
+#include "collect/stored/StoredDocument.h"
 #include "tools/zep/commands/Commands.h"
 #include "tools/zep/commands/Providers.h"
+#include "tools/zep/commands/Redacting.h"
 #include "tools/zep/commands/StoredReports.h"
+#include "tools/zep/commands/TMadeReport.h"
 #include "tools/zep/commands/Thresholds.h"
 #include "tools/zep/media/TMountedMedium.h"
 #include "tools/zep/output/FindingsText.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"
+#include "tools/zep/output/Question.h"
 #include "tools/zep/output/ReportJson.h"
 #include "tools/zep/output/ReportPhrases.h"
 #include "tools/zep/output/ReportText.h"
@@ -41,11 +46,13 @@ struct TArguments {
   TTransferOptions fOptions;
   TPlugInArguments fPlugIns;
   TReportParts fParts;
-  std::string fFailOn;    // a severity; empty for none
-  std::string fFrom;      // a stored report; empty for this machine
-  std::string fSince;     // a stored report to compare with; empty for none
-  std::string fHtmlFile;  // the page to write; empty for none
-  std::string fMedium;    // the device to write to; empty for standard output
+  TRedactionArguments fRedaction;
+  bool fIsConfirmed = false;  // a report is sent without a question
+  std::string fFailOn;        // a severity; empty for none
+  std::string fFrom;          // a stored report; empty for this machine
+  std::string fSince;         // a stored report to compare with; empty for none
+  std::string fHtmlFile;      // the page to write; empty for none
+  std::string fMedium;        // the device to write to; empty for standard output
 };
 
 // Whether the findings make the command fail.
@@ -75,10 +82,11 @@ std::vector<std::string> WriteAndUnmount(TMountedMedium const& medium, std::stri
 }
 
 // Returns the document about the medium.
-TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
-  std::string const name = ReportFileName(report, arguments.fAsJson ? ".json" : ".txt");
-  std::string const text =
-      arguments.fAsJson ? TReportDocument(report, EMessages::kVerbatim).Text() : ReportAsText(report, arguments.fParts);
+TJson WriteToMedium(TMadeReport const& made, TArguments const& arguments) {
+  TReport const& report = made.Report();
+  TReportDocument const contents = made.Document(EMessages::kVerbatim);
+  std::string const name = ReportFileName(contents.Members(), arguments.fAsJson ? ".json" : ".txt");
+  std::string const text = arguments.fAsJson ? contents.Text() : made.Text(arguments.fParts);
   TMountedMedium const medium(arguments.fMedium);
   std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);
   ThrowIfInterrupted(name + " was written to " + medium.Device() + ", which " + RemovalText(stillMountedAt));
@@ -94,22 +102,53 @@ TJson WriteToMedium(TReport const& report, TArguments const& arguments) {
 }
 
 // Returns the document of the report, or of the medium to which it was written. Without --json the report is printed here.
-TReportDocument PrintOrWrite(TReport const& report, TArguments const& arguments) {
-  if (!arguments.fMedium.empty()) return TReportDocument(WriteToMedium(report, arguments));
-  if (!arguments.fHtmlFile.empty()) PrintOrWritePage(AsStored(report), arguments.fHtmlFile);
-  if (arguments.fAsJson) return TReportDocument(report, EMessages::kWithoutSecrets);
-  if (arguments.fHtmlFile.empty()) WriteOutput(ReportAsText(report, arguments.fParts));
+TReportDocument PrintOrWrite(TMadeReport const& made, TArguments const& arguments) {
+  if (!arguments.fMedium.empty()) return TReportDocument(WriteToMedium(made, arguments));
+  if (arguments.fAsJson) return made.Document(EMessages::kWithoutSecrets);
+  if (arguments.fHtmlFile.empty()) WriteOutput(made.Text(arguments.fParts));
   return TReportDocument(TJson());
+}
+
+// Writes the page, if there is to be one. The failure of a report that is sent, too, is returned, so that it is still sent.
+std::optional<TFailure> WritePage(TMadeReport const& made, TArguments const& arguments) {
+  if (arguments.fHtmlFile.empty()) return std::nullopt;
+  try {
+    PrintOrWritePage(made.Stored(), arguments.fHtmlFile);
+    return std::nullopt;
+  } catch (TFailure const& failure) {
+    if (arguments.fTarget.empty()) throw;
+    return failure;
+  }
+}
+
+// Prints the number of secrets in the report, and asks on a terminal whether it is to be sent.
+bool IsSendingConfirmed(TReport const& report, TTarget const& target, TArguments const& arguments) {
+  TReportDocument document(report, EMessages::kVerbatim);
+  document.ReadInstances();
+  std::string const contents = ContentsText(CountSecrets(std::move(document.Members())), arguments.fRedaction.fKinds);
+  if (!arguments.fOptions.fQuiet) std::cerr << "zep: the report contains " << contents << "\n";
+  return arguments.fIsConfirmed || IsConfirmed("zep: send it to " + target.fRemote.fHost + "?");
+}
+
+// A report that was not sent because the user did not want that.
+TSentReport NotConfirmed() {
+  TSentReport sent;
+  sent.fTransferred.fOutcome = {kZEPStatusFail, kExitNothing, "this was not confirmed"};
+  std::cerr << "zep: the report was not sent\n";
+  return sent;
+}
+
+// Sets the exit status of the document, and why it is not 0.
+void SetOutcome(TJson& document, EExitStatus status, std::string const& reason) {
+  document["exitStatus"] = static_cast<int>(status);
+  document["reason"] = reason;
 }
 
 // Adds the result of sending. A report that was not sent makes the command fail.
 void AddSending(TJson& document, TSentReport const& sent) {
   TTransferred const& transferred = sent.fTransferred;
   bool const isSent = transferred.fOutcome.fExit == kExitComplete;
-  if (!isSent) {
-    document["exitStatus"] = static_cast<int>(transferred.fOutcome.fExit);
-    document["reason"] = ReasonOf(transferred);
-  }
+  if (!isSent) SetOutcome(document, transferred.fOutcome.fExit, ReasonOf(transferred));
   document["sent"] = {{"url", OrNull(transferred.fUrl)},
                       {"bytes", isSent ? TJson(transferred.fBytes) : TJson(nullptr)},
                       {"sha256", OrNull(transferred.fSha256)},
@@ -117,23 +156,33 @@ void AddSending(TJson& document, TSentReport const& sent) {
                       {"keptIn", OrNull(sent.fKeptIn)}};
 }
 
+EExitStatus Send(TMadeReport const& made, TTarget const& target, TArguments const& arguments, TJson& document) {
+  TSentReport const sent = IsSendingConfirmed(made.Report(), target, arguments)
+                               ? SendReport(made.Document(EMessages::kVerbatim), target, arguments.fOptions)
+                               : NotConfirmed();
+  AddSending(document, sent);
+  return sent.fTransferred.fOutcome.fExit;
+}
+
 // Prints or stores the report, and sends it if that was requested. The JSON document is printed last, because it contains the
 // exit status. From the mounting of the medium on, and while the report is sent, `guard` holds back interrupts.
-int Deliver(TReport const& report, TTarget const& target, TArguments const& arguments, std::optional<TInterruptGuard>& guard) {
+int Deliver(TMadeReport const& made, TTarget const& target, TArguments const& arguments, std::optional<TInterruptGuard>& guard) {
+  TReport const& report = made.Report();
   EExitStatus status = ExitStatusOf(report.fCompleteness);
   if (!arguments.fMedium.empty()) guard.emplace();
-  TReportDocument document = PrintOrWrite(report, arguments);
+  auto const pageFailure = WritePage(made, arguments);
+  TReportDocument document = PrintOrWrite(made, arguments);
   if (!arguments.fTarget.empty()) {
     if (!guard) guard.emplace();
-    TSentReport const sent = SendReport(report, target, arguments.fOptions);
-    if (sent.fTransferred.fOutcome.fExit != kExitComplete) status = sent.fTransferred.fOutcome.fExit;
-    AddSending(document.Members(), sent);
+    EExitStatus const sent = Send(made, target, arguments, document.Members());
+    if (sent != kExitComplete) status = sent;
   }
-  if (FailsBecauseOfFindings(report, arguments) && (status == kExitComplete || status == kExitPartial)) {
-    status = kExitFindings;
-    document.Members()["exitStatus"] = static_cast<int>(status);
-    document.Members()["reason"] = CountsOf(report.fFindings);
-  }
+  bool const isDelivered = status == kExitComplete || status == kExitPartial;
+  if (pageFailure) std::cerr << "zep: " << Printable(pageFailure->what()) << "\n";
+  if (pageFailure && isDelivered)
+    SetOutcome(document.Members(), status = pageFailure->fStatus, pageFailure->what());
+  else if (isDelivered && FailsBecauseOfFindings(report, arguments))
+    SetOutcome(document.Members(), status = kExitFindings, CountsOf(report.fFindings));
   if (arguments.fFormat == kJsonLines)
     document.WriteLines(WriteOutput);
   else if (arguments.fAsJson)
@@ -142,16 +191,26 @@ int Deliver(TReport const& report, TTarget const& target, TArguments const& argu
 }
 
 int ReportFrom(TArguments const& arguments) {
-  TStoredReport const report = ReadReport(arguments.fFrom);
-  PrintOrWritePage(report, arguments.fHtmlFile);
+  if (!arguments.fAsJson) {
+    TStoredReport const report = ReadReport(arguments.fFrom, arguments.fRedaction);
+    PrintOrWritePage(report, arguments.fHtmlFile);
+    return StatusOf(report);
+  }
+  if (!arguments.fRedaction.IsWanted()) throw TWrongUsage("--from and --json exclude each other without --redact");
+  TJson const document = ReadDocument(arguments.fFrom, arguments.fRedaction);
+  TStoredReport const report = StoredReportOf(document, arguments.fFrom);
+  if (!arguments.fHtmlFile.empty()) PrintOrWritePage(report, arguments.fHtmlFile);
+  WriteOutput(AsVerbatimText(document));
   return StatusOf(report);
 }
 
+// Both reports are redacted with the same map, so that they differ only where their originals do.
 int ReportSince(TArguments const& arguments) {
-  TStoredReport const before = ReadReport(arguments.fSince);
+  TStoredReport const before = ReadReport(arguments.fSince, arguments.fRedaction);
   auto const sample = SampleIf(arguments.fSample);
-  TReport const report = MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample, {ThresholdSettings()});
-  return PrintDifferences("zep report --since", before, AsStored(report), {arguments.fAsJson, arguments.fHtmlFile});
+  TReport report = MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample, {ThresholdSettings()});
+  TStoredReport const now = TMadeReport(std::move(report), arguments.fRedaction).Stored();
+  return PrintDifferences("zep report --since", before, now, {arguments.fAsJson, arguments.fHtmlFile});
 }
 
 // Prints the message of an interrupted run itself: the signal ends zep when `guard` ends.
@@ -165,7 +224,8 @@ int Report(TArguments const& arguments) {
     if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
     sample = SampleIf(arguments.fSample);
     TReportRules const rules = {ThresholdSettings()};
-    return Deliver(MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample, rules), target, arguments, guard);
+    TReport report = MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample, rules);
+    return Deliver(TMadeReport(std::move(report), arguments.fRedaction), target, arguments, guard);
   } catch (std::exception const& failure) {
     bool const isOfMedium = !arguments.fMedium.empty() && arguments.fAsJson && !HasWrittenOutput();
     if (isOfMedium) WriteOutput(FailureAsJson(kToMedia, StatusOf(failure), failure.what(), sample ? sample->fLabel : ""));
@@ -186,7 +246,7 @@ void AddStoredOptions(CLI::App& command, TArguments& arguments) {
     from->excludes(command.get_option(other));
     since->excludes(command.get_option(other));
   }
-  for (char const* other : {"--json", "--sample", "--plugin"}) from->excludes(command.get_option(other));
+  for (char const* other : {"--sample", "--plugin"}) from->excludes(command.get_option(other));
   for (char const* other : {"--to-media", "--section", "--full"})
     command.get_option("--html")->excludes(command.get_option(other));
 }
@@ -233,7 +293,9 @@ TRun AddReportArguments(CLI::App& command) {
       .add_option("--html", arguments->fHtmlFile,
                   "Write the report as a page to this file, which needs no other file, instead of printing it as text")
       ->type_name("FILE");
+  command.add_flag("--yes", arguments->fIsConfirmed, "Send without asking on the terminal");
   AddUploadOptions(command, arguments->fOptions);
+  AddRedactionOptions(command, arguments->fRedaction);
   AddPlugInOptions(command, arguments->fPlugIns);
   AddStoredOptions(command, *arguments);
   command.footer(

@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/commands/StoredReports.h"
 
+#include "collect/stored/StoredDocument.h"
 #include "tools/zep/html/DifferencesHtml.h"
 #include "tools/zep/html/ReportHtml.h"
 #include "tools/zep/output/DifferencesText.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/OutputFile.h"
-#include "tools/zep/output/ReportJson.h"
 #include "tools/zep/output/StoredReportText.h"
 
 namespace NQRVZEP20::zep {
@@ -20,8 +20,19 @@ TStoredReport ReadReport(std::string const& file) {
   }
 }
 
-TStoredReport AsStored(TReport const& report) {
-  return StoredReportFrom(TReportDocument(report, EMessages::kWithoutSecrets).Text(), "this report");
+TJson ReadDocument(std::string const& file, TRedactionArguments const& redaction) {
+  try {
+    TJson document = ReadStoredDocument(file);
+    StoredReportOf(document, file);
+    if (redaction.IsWanted()) RedactDocument(document, redaction);
+    return document;
+  } catch (TStoredReportError const& failure) {
+    throw TFailure(kExitNoInput, failure.what());
+  }
+}
+
+TStoredReport ReadReport(std::string const& file, TRedactionArguments const& redaction) {
+  return redaction.IsWanted() ? StoredReportOf(ReadDocument(file, redaction), file) : ReadReport(file);
 }
 
 EExitStatus StatusOf(TStoredReport const& report) {

@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "collect/Report.h"
 #include "collect/stored/Differences.h"
 #include "collect/stored/StoredReport.h"
+#include "tools/zep/commands/Redacting.h"
 #include "tools/zep/output/ExitStatus.h"
 
 #include <string>
@@ -13,8 +13,11 @@ namespace NQRVZEP20::zep {
 // Reads a stored report (ReadStoredReport). Throws TFailure with kExitNoInput if it is refused.
 TStoredReport ReadReport(std::string const& file);
 
-// The report as it would be read back from its document.
-TStoredReport AsStored(TReport const& report);
+// Reads the document of a stored report, and redacts it if that is wanted (RedactDocument). Throws in the same way.
+TJson ReadDocument(std::string const& file, TRedactionArguments const& redaction);
+
+// The report of that document.
+TStoredReport ReadReport(std::string const& file, TRedactionArguments const& redaction);
 
 // The exit status of the report, which its document states: kExitComplete, kExitPartial or kExitNothing.
 EExitStatus StatusOf(TStoredReport const& report);

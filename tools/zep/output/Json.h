@@ -7,6 +7,7 @@
 #include "TCIMValue.h"
 #include "collect/TNamespaceView.h"
 #include "collect/TValueWords.h"
+#include "collect/stored/StoredDocument.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Output.h"
@@ -22,7 +23,7 @@ namespace NQRVZEP20::zep {
 using TJson = nlohmann::ordered_json;
 
 // The version of the documents of zep. It is incremented when a change affects programs that read the documents.
-constexpr int kDocumentVersion = 2;
+constexpr int kDocumentVersion = kStoredVersion;
 
 // The common members of every document: its name (`what`), its version, whether it is about the sample, the exit status, and
 // why that is not kExitComplete. The reason is empty if and only if the status is kExitComplete. `sampleLabel` is the label of

@@ -12,6 +12,8 @@
 
 #include <cstring>
 #include <ctime>
+#include <map>
+#include <set>
 #include <string_view>
 
 namespace NQRVZEP20::zep {
@@ -95,6 +97,32 @@ std::vector<boost::shared_ptr<ICIMInstance>> ReadableInstances(TNamespaceView co
   return instances;
 }
 
+// The superclasses of a class, the nearest first.
+std::vector<std::string> SuperclassesOf(ICIMClass const& ofClass) {
+  std::vector<std::string> names;
+  for (auto above = ofClass.GetSuperClass(TCIMContext()); above; above = above->GetSuperClass(TCIMContext()))
+    names.push_back(above->GetName(TCIMContext()));
+  return names;
+}
+
+// The classes of all instances, each once. A class that fails while it is read is left out, like its instances.
+TJson ClassesAsJson(std::vector<TPlugIn> const& plugIns) {
+  std::map<std::string, std::vector<std::string>> classes;
+  std::set<ICIMClass const*> known;
+  for (TNamespaceView const& view : ViewsOf(plugIns)) {
+    std::string ignored;
+    for (auto const& instance : ReadableInstances(view, ignored))
+      FailureOf([&] {
+        auto const ofInstance = instance->GetClass(TCIMContext());
+        if (known.insert(ofInstance.get()).second)
+          classes.emplace(ofInstance->GetName(TCIMContext()), SuperclassesOf(*ofInstance));
+      });
+  }
+  TJson json = TJson::array();
+  for (auto const& [name, superclasses] : classes) json.push_back({{"class", name}, {"superclasses", superclasses}});
+  return json;
+}
+
 }  // namespace
 
 TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fMessages(messages), fPlugIns(&report.fPlugIns) {
@@ -110,13 +138,22 @@ TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fM
   fMembers["sections"] = SectionsAsJson(MakeSections(report.fPlugIns, SectionKeys()));
   fMembers["plugInDirectory"] = PlugInDirectory();
   fMembers["plugIns"] = PlugInsAsJson(report.fPlugIns);
+  fMembers["classes"] = ClassesAsJson(report.fPlugIns);
   fMembers["instances"] = nullptr;
+}
+
+void TReportDocument::ReadInstances() {
+  TJson instances = TJson::array();
+  TJson failures = ForEachInstance([&](TJson instance) { instances.push_back(std::move(instance)); });
+  fMembers["instances"] = std::move(instances);
+  if (!failures.empty()) fMembers["instanceFailures"] = std::move(failures);
+  fPlugIns = nullptr;
 }
 
 void TReportDocument::Write(TWriter const& write) const {
   std::string const text = TextOf(fMembers);
   std::size_t const line = text.find(kLineOfInstances);
-  if (line == text.npos) return write(text);
+  if (line == text.npos || fPlugIns == nullptr) return write(text);
   std::size_t const begin = line + std::strlen(kLineOfInstances);
   write(text.substr(0, begin) + "[");
   TJson members = fMembers;
@@ -142,6 +179,7 @@ std::string TReportDocument::LineOf(TJson json) const {
 void TReportDocument::WriteLines(TWriter const& write) const {
   TJson members = fMembers;
   members.erase("instances");
+  members.erase("instanceFailures");
   write(LineOf(std::move(members)));
   std::size_t count = 0;
   TJson const failures = ForEachInstance([&](TJson instance) {
@@ -169,7 +207,10 @@ TJson TReportDocument::WriteInstances(TWriter const& write) const {
 // result; what `use` throws is passed on.
 TJson TReportDocument::ForEachInstance(std::function<void(TJson instance)> const& use) const {
   TJson failures = TJson::array();
-  if (fPlugIns == nullptr) return failures;
+  if (fPlugIns == nullptr) {
+    for (TJson const& instance : fMembers.value("instances", TJson::array())) use(instance);
+    return fMembers.value("instanceFailures", failures);
+  }
   for (TNamespaceView const& view : ViewsOf(*fPlugIns)) {
     TInstanceJson json(view);
     std::string failure;

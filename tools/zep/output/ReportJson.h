@@ -25,11 +25,16 @@ public:
   // `report` is read while the document is written.
   TReportDocument(TReport const& report, EMessages messages);
 
-  // A document without instances, about a report that was written elsewhere.
-  explicit TReportDocument(TJson members) : fMembers(std::move(members)) {}
+  // A document that was made elsewhere: that of a redacted report, or one about a report that was written to a medium.
+  explicit TReportDocument(TJson members, EMessages messages = EMessages::kWithoutSecrets)
+      : fMessages(messages), fMembers(std::move(members)) {}
 
-  // All members; in place of the instances, null. They may be changed and added to.
+  // All members; in place of the instances, null before ReadInstances. They may be changed and added to.
   TJson& Members() { return fMembers; }
+  TJson const& Members() const { return fMembers; }
+
+  // Reads the instances now, so that they are members, too, and may be changed. The memory then depends on their number.
+  void ReadInstances();
 
   // Calls `write` with one piece of the text after the other; the text has the form of AsText. What `write` throws is passed on.
   void Write(TWriter const& write) const;

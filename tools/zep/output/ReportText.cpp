@@ -19,11 +19,6 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-constexpr char const* kFindings = "findings";
-constexpr char const* kIdentity = "identity";
-constexpr char const* kDetails = "details";
-constexpr char const* kPlugIns = "plug-ins";
-
 std::string ValueOf(TReportAnswer const& answer) {
   if (answer.IsKnown()) return ValueText(*answer.fValue) + (answer.fNote.empty() ? "" : " (" + answer.fNote + ")");
   return (answer.IsNotApplicable() ? "none: " : "unknown: ") + MessageWithoutSecrets(answer.fMissing.fReason);
@@ -95,8 +90,8 @@ std::string InstancesAsText(TReport const& report) {
 
 std::vector<std::string> SectionNames() {
   std::vector<std::string> names = SectionKeys();
-  names.insert(names.begin(), {kFindings, kIdentity, kDetails});
-  names.emplace_back(kPlugIns);
+  names.insert(names.begin(), {kFindingsPart, kIdentityPart, kDetailsPart});
+  names.emplace_back(kPlugInsPart);
   return names;
 }
 
@@ -106,12 +101,12 @@ std::string ReportAsText(TReport const& report, TReportParts const& parts) {
   for (std::string const& line : HeadLines(report)) text += Printable(line) + "\n";
   if (!report.fTableFile.empty())
     text += Printable("SMBIOS tables read from the file " + report.fTableFile + " (ZEP_SMBIOS_TABLE)") + "\n";
-  if (IsWanted(parts, kFindings)) text += "\n" + FindingsAsText(report.fFindings, label);
-  if (IsNamed(parts, kFindings)) text += "\n" + RulesAsText(report.fFindings, label);
-  if (IsWanted(parts, kIdentity)) text += "\n" + RowsAsText(label + "Identity", report.fIdentity);
-  if (IsWanted(parts, kDetails)) text += "\n" + RowsAsText(label + "Details", report.fDetails);
+  if (IsWanted(parts, kFindingsPart)) text += "\n" + FindingsAsText(report.fFindings, label);
+  if (IsNamed(parts, kFindingsPart)) text += "\n" + RulesAsText(report.fFindings, label);
+  if (IsWanted(parts, kIdentityPart)) text += "\n" + RowsAsText(label + "Identity", report.fIdentity);
+  if (IsWanted(parts, kDetailsPart)) text += "\n" + RowsAsText(label + "Details", report.fDetails);
   text += SectionsAsText(report, parts);
-  if (IsWanted(parts, kPlugIns)) text += "\n" + PlugInsAsText(label + "Plug-in", report.fPlugIns);
+  if (IsWanted(parts, kPlugInsPart)) text += "\n" + PlugInsAsText(label + "Plug-in", report.fPlugIns);
   return parts.fAllInstances ? text + InstancesAsText(report) : text;
 }
 

@@ -8,6 +8,12 @@
 
 namespace NQRVZEP20::zep {
 
+// The parts of the report that are not sections of collect/Sections.h.
+constexpr char const* kFindingsPart = "findings";
+constexpr char const* kIdentityPart = "identity";
+constexpr char const* kDetailsPart = "details";
+constexpr char const* kPlugInsPart = "plug-ins";
+
 // The parts of the report to print.
 struct TReportParts {
   std::vector<std::string> fSections;  // keys (SectionNames); empty for all

@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/transfer/ReportFileName.h"
 
-#include "tools/zep/output/ReportPhrases.h"
-
 #include <algorithm>
 #include <cctype>
 #include <ctime>
@@ -13,9 +11,9 @@ namespace {
 
 constexpr std::size_t kLongestHostName = 64;
 
-std::string HostNameIn(TReport const& report) {
-  TReportRow const* const row = report.FindRow("hostName");
-  return row != nullptr && row->fAnswer.IsKnown() ? ValueText(*row->fAnswer.fValue) : "unknown";
+std::string HostNameIn(TJson const& document) {
+  TJson const name = document.value("/identity/hostName/value"_json_pointer, TJson(nullptr));
+  return name.is_string() ? name.get<std::string>() : "unknown";
 }
 
 std::string Cleaned(std::string host) {
@@ -34,8 +32,8 @@ std::string TimeText() {
 
 }  // namespace
 
-std::string ReportFileName(TReport const& report, char const* extension) {
-  return "zep-report-" + Cleaned(HostNameIn(report)) + "-" + TimeText() + extension;
+std::string ReportFileName(TJson const& document, char const* extension) {
+  return "zep-report-" + Cleaned(HostNameIn(document)) + "-" + TimeText() + extension;
 }
 
 }  // namespace NQRVZEP20::zep

@@ -17,9 +17,9 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-void WriteReport(TReport const& report, std::string const& file) {
+void WriteReport(TReportDocument const& document, std::string const& file) {
   std::ofstream stream(file, std::ios::binary);
-  stream << Gzipped(TReportDocument(report, EMessages::kVerbatim).Text());
+  stream << Gzipped(document.Text());
   stream.close();
   if (!stream) throw std::system_error(errno, std::generic_category(), file);
 }
@@ -39,10 +39,10 @@ TTransferred Send(std::string const& file, TTarget const& target, TTransferOptio
   }
 }
 
-TSentReport WriteAndSend(TReport const& report, TTarget const& target, TTransferOptions const& options) {
+TSentReport WriteAndSend(TReportDocument const& document, TTarget const& target, TTransferOptions const& options) {
   TScratchDirectory directory("zep-report");
-  std::string const file = directory.Path(ReportFileName(report, ".json.gz"));
-  WriteReport(report, file);
+  std::string const file = directory.Path(ReportFileName(document.Members(), ".json.gz"));
+  WriteReport(document, file);
   TSentReport sent{Send(file, target, options), ""};
   if (sent.fTransferred.fOutcome.fExit == kExitComplete) return sent;
   directory.Keep();
@@ -67,10 +67,10 @@ void Tell(TSentReport const& sent, bool isQuiet) {
 
 }  // namespace
 
-TSentReport SendReport(TReport const& report, TTarget const& target, TTransferOptions const& options) {
+TSentReport SendReport(TReportDocument const& document, TTarget const& target, TTransferOptions const& options) {
   TSentReport sent;
   try {
-    sent = WriteAndSend(report, target, options);
+    sent = WriteAndSend(document, target, options);
   } catch (std::exception const& failure) {
     sent.fTransferred = NotBegun(failure);
   }

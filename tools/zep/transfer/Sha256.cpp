@@ -64,4 +64,10 @@ std::string Sha256Of(std::string const& file) {
   return DigitsOf(gcry_md_read(hash.get(), GCRY_MD_SHA256), gcry_md_get_algo_dlen(GCRY_MD_SHA256));
 }
 
+std::string Sha256OfText(std::string const& text) {
+  THash const hash = NewHash();
+  gcry_md_write(hash.get(), text.data(), text.size());
+  return DigitsOf(gcry_md_read(hash.get(), GCRY_MD_SHA256), gcry_md_get_algo_dlen(GCRY_MD_SHA256));
+}
+
 }  // namespace NQRVZEP20::zep

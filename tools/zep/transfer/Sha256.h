@@ -9,4 +9,7 @@ namespace NQRVZEP20::zep {
 // empty. Throws std::system_error if the file cannot be read, and std::runtime_error if libgcrypt does not provide SHA-256.
 std::string Sha256Of(std::string const& file);
 
+// The same of a text.
+std::string Sha256OfText(std::string const& text);
+
 }  // namespace NQRVZEP20::zep

@@ -110,6 +110,10 @@ TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
       {"zep report", 64, {"report", "--format", "json", "--since", "there"}},
       {"zep report", 66, {"report", "--json", "--since", "there"}},
       {"zep report", 64, {"report", "--json", "--from", "a.json"}},
+      {"zep report", 64, {"report", "--json", "--sample", "--redact", "names"}},
+      {"zep report", 73, {"report", "--json", "--sample", "--redact", "--redaction-map", "/nowhere/map"}},
+      {"zep unredact", 66, {"unredact", "--json", "there", "--map", "there"}},
+      {"zep unredact", 66, {"unredact", "--json", "a.json", "--map", "there"}},
       {"zep diff", 66, {"diff", "--json", "there", "there"}},
       {"zep diff", 1, {"diff", "--json", "a.json", "b.json"}},
       {"zep diff", 73, {"diff", "--json", "a.json", "b.json", "--html", "/nowhere/page"}},
@@ -166,8 +170,11 @@ TEST_F(EnvelopeTest, WpadWithoutPermissionToListenPrintsADocument) {
 
 // The commands that are missing here need a server or a device; tests/system checks their documents.
 TEST_F(EnvelopeTest, EveryCommandThatSucceedsPrintsADocumentWithItsExitStatus) {
+  Write("redacted.json", Run({"report", "--sample", "--json", "--redact", "--redaction-map", "map"}).fOutput);
   TRow const rows[] = {
       {"zep report", 0, {"report", "--json", "--sample"}},
+      {"zep report", 0, {"report", "--json", "--sample", "--redact", "--redaction-map", "map"}},
+      {"zep report", 0, {"unredact", "--json", "redacted.json", "--map", "map"}},
       {"zep diff", 0, {"diff", "--json", "a.json", "a.json"}},
       {"zep show", 0, {"show", "CIM_Chassis", "--json", "--sample"}},
       {"zep show", 0, {"show", "X_A", "--json", "--mof", "good.mof"}},

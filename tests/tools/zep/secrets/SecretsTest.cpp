@@ -183,6 +183,9 @@ TEST_F(WrongPlaceTest, NoArgumentOfAnyCommandIsPrintedWithItsPassword) {
       {{"report", "--from", "@", "--html", "@"}},
       {{"report", "--json", "--since", "@"}},
       {{"report", "--format", "@"}},
+      {{"report", "--sample", "--redact", "@", "--redaction-map", "@"}, "hosts"},
+      {{"unredact", "@", "--map", "@"}},
+      {{"unredact", "--json", "@", "--map", "@"}},
       {{"diff", "@", "@"}},
       {{"diff", "--json", "@", "@", "--html", "@"}},
       {{"show", "@"}},
@@ -251,6 +254,7 @@ TEST_F(WrongPlaceTest, NoFileIsPrintedWithItsPassword) {
     ExpectHidden({"remote", "h", "--user", "u", "--password-file", file, "--debug-log", log});
     ExpectHidden({"mof", file});
     ExpectHidden({"report", "--from", file});
+    ExpectHidden({"unredact", file, "--map", file});
     ExpectHidden({"diff", "--json", File("quoted", "\"" + text + "\n"), file});
     ExpectHidden({"mof", "--json", file});
     ExpectHidden({"classes", "--mof", file});

@@ -10,37 +10,33 @@
 namespace NQRVZEP20::zep {
 namespace {
 
-TReport ReportOn(TReportAnswer const& hostName) {
-  TReport report{};
-  report.fIdentity = {{"productName", "Product name", TReportAnswer::Known("Server", "")}, {"hostName", "Host name", hostName}};
-  return report;
-}
+TJson ReportOn(TJson const& hostName) { return {{"identity", {{"hostName", {{"value", hostName}}}}}}; }
 
 TEST(ReportFileNameTest, BearsTheHostNameOfTheReport) {
   struct TRow {
-    TReportAnswer fHostName;
+    TJson fHostName;
     std::string fInName;
   };
   TRow const rows[] = {
-      {TReportAnswer::Known("db1", ""), "db1"},
-      {TReportAnswer::Known("DB-1.example.com", ""), "DB-1_example_com"},
-      {TReportAnswer::Known("../a b\xc3\xa4\n", ""), "___a_b___"},
-      {TReportAnswer::Known(std::string(100, 'x'), ""), std::string(64, 'x')},
-      {TReportAnswer(), "unknown"},
+      {"db1", "db1"},
+      {"DB-1.example.com", "DB-1_example_com"},
+      {"../a b\xc3\xa4\n", "___a_b___"},
+      {std::string(100, 'x'), std::string(64, 'x')},
+      {TJson(nullptr), "unknown"},
   };
   for (TRow const& row : rows) {
     SCOPED_TRACE(row.fInName);
     EXPECT_THAT(ReportFileName(ReportOn(row.fHostName), ".txt"),
                 testing::MatchesRegex("zep-report-" + row.fInName + "-[0-9]{8}T[0-9]{6}Z\\.txt"));
   }
-  EXPECT_THAT(ReportFileName({}, ".json"), testing::MatchesRegex("zep-report-unknown-[0-9]{8}T[0-9]{6}Z\\.json"));
+  EXPECT_THAT(ReportFileName(TJson::object(), ".json"), testing::MatchesRegex("zep-report-unknown-[0-9]{8}T[0-9]{6}Z\\.json"));
 }
 
 TEST(ReportFileNameTest, BearsTheTimeInUtc) {
   TEnvironmentGuard const zone("TZ", "EAST-5");
   ::tzset();
   std::time_t const before = std::time(nullptr);
-  std::string const name = ReportFileName(ReportOn(TReportAnswer::Known("db1", "")), ".json");
+  std::string const name = ReportFileName(ReportOn("db1"), ".json");
   std::tm fields{};
   ASSERT_NE(::strptime(name.c_str(), "zep-report-db1-%Y%m%dT%H%M%SZ.json", &fields), nullptr) << name;
   std::time_t const told = ::timegm(&fields);

@@ -42,7 +42,7 @@ TEST(SendReportTest, IsKeptAlsoWhenSendingThrows) {
   TSentReport sent;
   {
     TOneDescriptorLeft const oneLeft;
-    sent = SendReport(report, target, {});
+    sent = SendReport(TReportDocument(report, EMessages::kVerbatim), target, {});
   }
   EXPECT_EQ(sent.fTransferred.fOutcome.fExit, kExitNothing);
   EXPECT_THAT(sent.fKeptIn, testing::StartsWith(dir.Path()));
