@@ -15,12 +15,12 @@ namespace {
 void AskMemory(TRuleRun& run) {
   constexpr std::uint64_t gibibyte = 1ull << 30, least = 64;
   std::uint64_t bytes = 0;
-  auto const modules = run.Elements("CIM_PhysicalMemory");  // notes the reason if there are none
+  auto const modules = run.Elements("CIM_PhysicalMemory");  // notes the reason if they cannot be described
   for (TElement const& module : modules) {
     auto const capacity = module.Number("Capacity");
     if (run.Know(module, capacity)) bytes += *capacity.fValue;  // notes the reason if the value is missing
   }
-  if (run.GetNotAsked().empty() && bytes < least * gibibyte)
+  if (!modules.empty() && run.GetNotAsked().empty() && bytes < least * gibibyte)
     run.Add(modules.front(), modules.front().Number("Capacity").fSource, ESeverity::kWarning,
             "the memory of " + std::to_string(bytes / gibibyte) + " GiB is smaller than " + std::to_string(least) + " GiB",
             "Add memory modules.");

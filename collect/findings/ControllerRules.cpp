@@ -90,7 +90,7 @@ void AskAccounts(TRuleRun& run) {
     auto const hasAccess = account.Flag("HasLANAccess");
     auto const privilege = account.Text("Privilege"), name = account.Text("UserID");
     if (!run.Know(account, state) || *state.fValue != enabled) continue;
-    if (!hasAccess.IsKnown() || !*hasAccess.fValue || !privilege.IsKnown()) continue;
+    if (!hasAccess.IsKnown() || !*hasAccess.fValue || !privilege.IsKnown() || *privilege.fValue == "No Access") continue;
     if (!name.IsKnown() && name.fMissing.fCode != kMissingNotGiven)
       run.Know(account, name);
     else if (!name.IsKnown())

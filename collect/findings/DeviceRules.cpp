@@ -49,7 +49,7 @@ std::set<std::string> DevicesOfDisplays(TRuleRun const& run, std::map<std::strin
   for (TElement const& function : run.TryElements("CIM_PCIDevice")) {
     auto const code = function.Number("ClassCode");
     if (!code.IsKnown() || *code.fValue != display) continue;
-    std::string const address = *function.Text("DeviceID").fValue;
+    std::string const address = function.NameIn("DeviceID");
     devices.insert(DeviceOf(address));
     auto bridge = bridges.find(address);
     while (bridge != bridges.end() && devices.insert(DeviceOf(bridge->second)).second) bridge = bridges.find(bridge->second);
@@ -65,10 +65,10 @@ void AskPciLink(TRuleRun& run) {
   auto const bridges = BridgesOf(run);
   auto const displays = DevicesOfDisplays(run, bridges);
   std::map<std::string, TLinkEnd> ends;
-  for (TElement const& link : links) ends[*link.Text("DeviceID").fValue] = LinkEndOf(link);
+  for (TElement const& link : links) ends[link.NameIn("DeviceID")] = LinkEndOf(link);
 
   for (TElement const& link : links) {
-    std::string const address = *link.Text("DeviceID").fValue;
+    std::string const address = link.NameIn("DeviceID");
     auto const bridge = bridges.find(address);
     if (bridge == bridges.end() || ends.count(bridge->second) == 0) continue;  // an end of no link, or its upper end
     if (!IsFirstFunction(address)) continue;

@@ -82,7 +82,7 @@ void AskWeaknesses(TRuleRun& run) {
     auto const state = weakness.Number("State");
     if (!run.Know(weakness, state) || *state.fValue != vulnerable) continue;
     if (first == nullptr) first = &weakness;
-    names += (names.empty() ? "" : ", ") + *weakness.Text("Name").fValue;
+    names += (names.empty() ? "" : ", ") + weakness.NameIn("Name");
   }
   if (first == nullptr) return;
   bool const isGuest = IsVirtual(run);

@@ -15,7 +15,7 @@ void AskFailingDisk(TRuleRun& run) {
     auto const state = disk.Number("HealthState");
     if (run.Know(disk, state) && *state.fValue != healthy)
       run.Add(disk, state.fSource, ESeverity::kCritical,
-              "the disk " + *disk.Text("DeviceID").fValue + " reports that it is failing (SMART)", kReplaceDisk);
+              "the disk " + disk.NameIn("DeviceID") + " reports that it is failing (SMART)", kReplaceDisk);
   }
 }
 
@@ -34,7 +34,7 @@ void AskLostDisk(TRuleRun& run) {
     if (!IsLost(*status.fValue)) continue;
     auto const words = disk.Texts("StatusDescriptions");
     std::string const word = words.IsKnown() && !words.fValue->empty() ? " (" + words.fValue->front() + ")" : "";
-    run.Add(disk, status.fSource, ESeverity::kError, "the kernel cannot use the disk " + *disk.Text("DeviceID").fValue + word,
+    run.Add(disk, status.fSource, ESeverity::kError, "the kernel cannot use the disk " + disk.NameIn("DeviceID") + word,
             "Check its cable, backplane and power; look in the kernel's log for the first error of the disk.");
   }
 }
@@ -92,7 +92,7 @@ void AskDegradedArray(TRuleRun& run) {
     auto const missing = array.Number("MissingMembers"), members = array.Number("Members"),
                redundancy = array.Number("PackageRedundancy");
     if (!run.Know(array, missing) || *missing.fValue == 0) continue;
-    std::string const name = "the RAID array " + *array.Text("DeviceID").fValue;
+    std::string const name = "the RAID array " + array.NameIn("DeviceID");
     std::string const state = array.Text("State").IsKnown() ? *array.Text("State").fValue : "";
     std::string const lacks = MembersText(*missing.fValue, members.IsKnown() ? *members.fValue : *missing.fValue) + " missing";
     auto const action = array.Text("Action");

@@ -45,6 +45,11 @@ std::string TElement::Label() const {
   return "";
 }
 
+std::string TElement::NameIn(std::string const& property) const {
+  auto const text = Text(property);
+  return text.IsKnown() ? *text.fValue : Path();
+}
+
 TAnswer<std::string> TElement::Text(std::string const& property) const {
   return Converted<std::string>(Value(property), [](TCIMValue const& value) {
     return IsArray(value) ? std::nullopt : std::optional<std::string>(value.ToString());

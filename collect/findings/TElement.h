@@ -25,6 +25,9 @@ public:
   // ElementName, or without one DeviceID, Name or Tag: the name that a person uses. Empty if there is none.
   std::string Label() const;
 
+  // The text of a property that names the element, such as a key. Without one, which only a faulty plug-in leaves out: the path.
+  std::string NameIn(std::string const& property) const;
+
   TAnswer<TCIMValue> Value(std::string const& property) const { return fView->Answer(*fInstance, property); }
   TAnswer<std::string> Text(std::string const& property) const;      // of a value that is not an array
   TAnswer<std::uint64_t> Number(std::string const& property) const;  // of a whole number that is not negative

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/redaction/DocumentTexts.h"
 
+#include "collect/redaction/Texts.h"
+
 #include <algorithm>
 #include <unordered_set>
 
@@ -16,10 +18,13 @@ constexpr std::string_view kNames[] = {"class", "classes",  "code",      "column
                                        "rule",  "severity", "stage",     "status",  "superclasses", "thresholds", "time",
                                        "title", "type",     "unit",      "worst",   "zep"};
 
-bool IsName(std::string_view member, TJson const& value) {
-  bool const isText = value.is_string() || value.is_array() || member == "thresholds" || member == "redaction";
-  return isText && std::binary_search(std::begin(kNames), std::end(kNames), member);
+bool IsName(std::string_view member, TJson const& value, TPlace const& place) {
+  if (member == "redaction" && place.AsText().empty()) return true;
+  if (member == "thresholds" && place.AsText() == "/findings") return true;
+  return (value.is_string() || value.is_array()) && std::binary_search(std::begin(kNames), std::end(kNames), member);
 }
+
+bool IsIdentifierByte(char byte) { return byte == '_' || (IsWordByte(byte) && static_cast<unsigned char>(byte) < 0x80); }
 
 // Whether the object is a property whose value is a number or a time, perhaps as a text.
 bool IsNumber(TJson const& object) {
@@ -37,7 +42,10 @@ public:
     auto const instances = document.find("instances");
     if (instances == document.end() || !instances->is_array()) return;
     for (TJson const& instance : *instances)
-      if (instance.is_object()) fNamespaces.insert(instance.value("namespace", ""));
+      if (instance.is_object()) {
+        fNamespaces.insert(instance.value("namespace", ""));
+        fClasses.insert(instance.value("class", ""));
+      }
   }
 
   void Rewrite(TJson& json, TPlace const& place) {
@@ -60,18 +68,20 @@ private:
   void RewriteMembers(TJson& object, TPlace const& place) {
     bool const isNumber = IsNumber(object);
     for (auto& [name, value] : object.get_ref<TJson::object_t&>())
-      if (!IsName(name, value) && !(isNumber && name == "value")) Rewrite(value, TPlace(&place, name));
+      if (!IsName(name, value, place) && !(isNumber && name == "value")) Rewrite(value, TPlace(&place, name));
   }
 
   // The size of the namespace and the class with which an object path begins; 0 of any other text.
   std::size_t BeginOfKeys(std::string const& text) const {
     std::size_t const colon = text.find(':');
     if (colon == text.npos || fNamespaces.count(text.substr(0, colon)) == 0) return 0;
-    return std::min(text.find_first_of(".#", colon), text.size());
+    std::size_t end = colon + 1;
+    while (end < text.size() && IsIdentifierByte(text[end])) ++end;
+    return fClasses.count(text.substr(colon + 1, end - colon - 1)) == 0 ? 0 : end;
   }
 
   TUseText const& fUse;
-  std::unordered_set<std::string> fNamespaces;
+  std::unordered_set<std::string> fNamespaces, fClasses;
 };
 
 }  // namespace

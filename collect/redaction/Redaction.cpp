@@ -19,6 +19,30 @@ using TKinds = std::vector<ESecretKind>;
 
 constexpr char const* kRedaction = "redaction";
 
+// Whether the property contains domains: their first labels are words such as "dev".
+bool IsDomain(std::string const& property) {
+  return property == "SearchDomains" || property == "DomainName" || property == "DNSSuffixesToRegister";
+}
+
+// The name or address in a URL, or in an address with a port, a prefix length or a zone.
+std::string HostIn(std::string const& text) {
+  std::size_t const scheme = text.find("://");
+  std::string host = scheme == text.npos ? text : text.substr(scheme + 3);
+  host = host.substr(0, host.find_first_of("/%"));
+  if (scheme != text.npos) host = host.substr(host.rfind('@') + 1);
+  if (host.rfind('[', 0) == 0) return host.substr(1, host.find(']') - 1);
+  bool const hasPort = std::count(host.begin(), host.end(), ':') == 1;
+  return hasPort ? host.substr(0, host.find(':')) : host;
+}
+
+// Whether the text belongs to the result of sending, which was added after the redaction.
+bool IsOfSending(TJson const& document, std::string const& place) {
+  auto const sent = document.find("sent");
+  if (sent == document.end() || !sent->is_object()) return false;
+  bool const hasFailed = sent->value("bytes", TJson()).is_null();
+  return place.rfind("/sent/", 0) == 0 || (hasFailed && place == "/reason");
+}
+
 bool IsIn(TKinds const& kinds, ESecretKind kind) { return std::find(kinds.begin(), kinds.end(), kind) != kinds.end(); }
 
 // Whether the member of a document is a message of a plug-in, the kernel or zep.
@@ -43,7 +67,11 @@ public:
 
 private:
   void ReadClasses(TJson const& classes) {
-    for (TJson const& row : classes) fClasses[row.value("class", "")] = row.value("superclasses", std::vector<std::string>());
+    try {
+      for (TJson const& row : classes) fClasses[row.at("class")] = row.at("superclasses").get<std::vector<std::string>>();
+    } catch (TJson::exception const&) {
+      throw TRedactionError("/classes: is not a list of classes with their superclasses");
+    }
   }
 
   // The class and its superclasses. A document without the member "classes" has only the class.
@@ -63,7 +91,11 @@ private:
     TJson const& properties = instance["properties"];
     for (auto const& [name, property] : properties.get_ref<TJson::object_t const&>()) {
       TJson const& value = property["value"];
-      if (auto const kind = KindOfProperty(classes, name)) AddAll(*kind, value);
+      if (IsDomain(name))
+        ForEachString(value, [&](std::string const& text) { Add(ESecretKind::kHosts, text); });
+      else if (auto const kind = KindOfProperty(classes, name))
+        AddAll(*kind, value);
+      if (name == "InstanceID") ForEachString(value, [&](std::string const& text) { AddIdOfPool(text); });
       if (name == "OtherIdentifyingInfo") CollectDescribed(properties, value);
       if (IsFreeText(name)) ForEachString(value, [&](std::string const& text) { CollectShapes(text, true); });
     }
@@ -74,14 +106,23 @@ private:
     auto const found = properties.find("IdentifyingDescriptions");
     if (found == properties.end() || !values.is_array()) return;
     TJson const& descriptions = (*found)["value"];
+    if (!descriptions.is_array()) return;
     for (std::size_t at = 0; at < std::min(values.size(), descriptions.size()); ++at)
       if (values[at].is_string() && descriptions[at].is_string() &&
           DescribesSerial(descriptions[at].get_ref<std::string const&>()))
         Add(ESecretKind::kSerials, values[at].get<std::string>());
   }
 
-  void CollectShapes(std::string_view text, bool withIPv4) {
-    for (std::string const& address : AddressesIn(text, withIPv4)) Add(ESecretKind::kAddresses, address);
+  // The identifier of a volume group of LVM, of 32 characters, which is also a part of those of its volumes.
+  void AddIdOfPool(std::string const& id) {
+    constexpr std::string_view pool = "ZEP:pool:";
+    if (id.rfind(pool, 0) == 0) Add(ESecretKind::kSerials, id.substr(pool.size()));
+  }
+
+  void CollectShapes(std::string_view text, bool isMessage) {
+    for (std::string const& address : AddressesIn(text, isMessage)) Add(ESecretKind::kAddresses, address);
+    if (isMessage)
+      for (std::string const& uuid : UuidsIn(text)) Add(ESecretKind::kSerials, uuid);
     for (std::string const& user : HomesIn(text)) Add(ESecretKind::kUsers, user);
   }
 
@@ -98,7 +139,7 @@ private:
 
   // The name of a host may be its address, and the access information of a service a name.
   void AddTyped(ESecretKind kind, std::string const& value) {
-    std::string const text = value.substr(0, kind == ESecretKind::kAddresses ? value.find_first_of("/%") : value.npos);
+    std::string const text = kind == ESecretKind::kAddresses ? HostIn(value) : value;
     bool const isAddress = IsIPv4(text) || IsIPv6(text) || IsMac(text);
     if (kind == ESecretKind::kHosts && isAddress) return Add(ESecretKind::kAddresses, text);
     Add(kind, text);
@@ -125,6 +166,17 @@ TSecretCounts CountSecrets(TJson document) {
 
 bool IsRedacted(TJson const& document) { return document.contains(kRedaction); }
 
+TRedactedWith RedactedWith(TJson const& document) {
+  try {
+    TRedactedWith result{{}, document.at(kRedaction).at("map")};
+    for (TJson const& name : document.at(kRedaction).at("kinds").get_ref<TJson::array_t const&>())
+      if (auto const kind = SecretKindFrom(name.get_ref<std::string const&>())) result.fKinds.push_back(*kind);
+    return result;
+  } catch (TJson::exception const&) {
+    throw TRedactionError("/redaction: has no kinds and no map");
+  }
+}
+
 void Redact(TJson& document, TKinds const& kinds, TPseudonyms& pseudonyms) {
   TSecretIndex index;
   for (TSecret const& secret : pseudonyms.Secrets())
@@ -139,12 +191,13 @@ void Redact(TJson& document, TKinds const& kinds, TPseudonyms& pseudonyms) {
 
 void Unredact(TJson& document, TPseudonyms const& pseudonyms) {
   if (!IsRedacted(document)) throw TRedactionError("it is not redacted");
-  if (document[kRedaction].value("map", "") != pseudonyms.Id()) throw TRedactionError("it was redacted with another map");
+  if (RedactedWith(document).fMap != pseudonyms.Id()) throw TRedactionError("it was redacted with another map");
   document.erase(kRedaction);
   TSecretIndex const none;
   RewriteTexts(document, [&](std::string_view text, TPlace const& place) {
     return none.Rewritten(text, [&](TSecret const*, std::string const& pseudonym) {
       std::string const* const spelling = pseudonyms.SpellingOf(pseudonym);
+      if (spelling == nullptr && IsOfSending(document, place.AsText())) return pseudonym;
       if (spelling == nullptr) throw TRedactionError(place.AsText() + ": " + pseudonym + " is not in the map");
       return *spelling;
     });

@@ -14,6 +14,7 @@ namespace {
 using TTexts = std::vector<std::string>;
 
 constexpr std::size_t kShortestHex = 8, kUuidDigits = 32;
+constexpr std::size_t kShortestBase64 = 6;  // shorter values have forms that are common words
 
 std::string HexOf(std::string_view bytes) {
   constexpr char digits[] = "0123456789abcdef";
@@ -129,7 +130,8 @@ void AddEncodings(TTexts& texts, std::string_view value) {
   texts.push_back(HexOf(Utf16(value, false)));
   texts.push_back(Utf16(value, false));
   texts.push_back(Utf16(value, true));
-  for (std::size_t skipped = 0; skipped < 3; ++skipped) texts.push_back(Base64(value, skipped));
+  if (value.size() >= kShortestBase64)
+    for (std::size_t skipped = 0; skipped < 3; ++skipped) texts.push_back(Base64(value, skipped));
   texts.push_back(PercentEncoded(value));
   texts.push_back(WithEscapes(value));
 }

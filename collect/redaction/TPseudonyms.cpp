@@ -15,6 +15,7 @@ using TJson = TPseudonyms::TJson;
 
 constexpr char const* kDocument = "zep redaction map";
 constexpr int kMapVersion = 1;
+constexpr std::size_t kGreatestNumber = 999999999;  // nine digits
 
 constexpr std::string_view kPrefixes[] = {"serial", "host", "address", "user", "text"};  // the first ones as in ESecretKind
 
@@ -22,7 +23,7 @@ std::string PrefixOf(TSecret const* secret) {
   return std::string(secret == nullptr ? kPrefixes[kSecretKinds.size()] : kPrefixes[static_cast<std::size_t>(secret->fKind)]);
 }
 
-// The parts of a pseudonym; the prefix of what is none is empty.
+// The parts of a pseudonym. Without a prefix, the text is not a pseudonym.
 struct TParts {
   std::string_view fPrefix;
   std::size_t fNumber = 0;
@@ -119,6 +120,7 @@ void TPseudonyms::Add(std::string const& pseudonym, std::string const& spelling)
 
 std::string TPseudonyms::NewPseudonym(std::string const& prefix) const {
   auto const last = fLast.find(prefix);
+  if (last != fLast.end() && last->second >= kGreatestNumber) throw TRedactionError("its pseudonyms are used up");
   return prefix + "-" + std::to_string(last == fLast.end() ? 1 : last->second + 1);
 }
 

@@ -7,6 +7,7 @@
 #include "collect/redaction/Texts.h"
 
 #include <algorithm>
+#include <set>
 
 namespace NQRVZEP20 {
 
@@ -47,7 +48,7 @@ void TSecretIndex::Add(ESecretKind kind, std::string const& value) {
   fSecrets.push_back({kind, value});
   bool const isExact = IsLetters(value);
   if (isExact)
-    for (std::string const& text : {value, Upper(value)}) AddSpelling({text, 0, secret, true});
+    for (std::string const& text : std::set<std::string>{value, Upper(value), Lower(value)}) AddSpelling({text, 0, secret, true});
   for (std::string const& text : SpellingsOf(value)) {
     if (isExact && text == Lower(value)) continue;
     AddSpelling({text, 0, secret, false});

@@ -24,6 +24,23 @@ std::string_view WithoutMarks(std::string_view text) {
   return endsInColon ? text.substr(0, text.size() - 1) : text;
 }
 
+// The addresses in a run of address bytes that is none as a whole: "192.0.2.1:80", "192.0.2.1-192.0.2.9", and the two MAC
+// addresses at the begin of the header of a frame, as the kernel's packet filter logs it.
+void AddParts(std::string_view text, std::size_t begin, std::size_t end, bool withIPv4, std::vector<std::string>& addresses) {
+  constexpr std::size_t mac = 17, header = 41;
+  std::string_view const first = text.substr(begin, mac), second = text.substr(std::min(begin + mac + 1, text.size()), mac);
+  if (end - begin == header && IsMac(first) && IsMac(second)) {
+    addresses.emplace_back(first);
+    addresses.emplace_back(second);
+  }
+  for (std::size_t at = begin; withIPv4 && at < end;) {
+    std::size_t const partEnd = std::min(text.find_first_of(":-", at), end);
+    std::string_view const part = WithoutMarks(text.substr(at, partEnd - at));
+    if (IsIPv4(part) && IsWordBound(text, at, partEnd)) addresses.emplace_back(part);
+    at = partEnd + 1;
+  }
+}
+
 }  // namespace
 
 std::string Lower(std::string_view text) {
@@ -68,10 +85,31 @@ std::vector<std::string> AddressesIn(std::string_view text, bool withIPv4) {
     while (end < text.size() && IsAddressByte(text[end])) ++end;
     std::string_view const token = WithoutMarks(text.substr(at, end - at));
     bool const isWhole = IsWordBound(text, at, end);
-    if (isWhole && (IsMac(token) || IsIPv6(token) || (withIPv4 && IsIPv4(token)))) addresses.emplace_back(token);
+    if (isWhole && (IsMac(token) || IsIPv6(token) || (withIPv4 && IsIPv4(token))))
+      addresses.emplace_back(token);
+    else
+      AddParts(text, at, end, withIPv4, addresses);
     at = end + 1;
   }
   return addresses;
+}
+
+std::vector<std::string> UuidsIn(std::string_view text) {
+  constexpr std::size_t length = 36;
+  auto const isUuid = [](std::string_view token) {
+    for (std::size_t at = 0; at < length; ++at) {
+      bool const isHyphen = at == 8 || at == 13 || at == 18 || at == 23;
+      if (isHyphen ? token[at] != '-' : !IsHex(token.substr(at, 1))) return false;
+    }
+    return true;
+  };
+  std::vector<std::string> uuids;
+  for (std::size_t at = 0; at + length <= text.size(); ++at) {
+    if (!IsWordBound(text, at, at + length) || (at > 0 && text[at - 1] == '-') || !isUuid(text.substr(at, length))) continue;
+    uuids.emplace_back(text.substr(at, length));
+    at += length;
+  }
+  return uuids;
 }
 
 std::vector<std::string> HomesIn(std::string_view text) {

@@ -40,6 +40,10 @@ bool IsMac(std::string_view text);
 // IPv4 addresses, too.
 std::vector<std::string> AddressesIn(std::string_view text, bool withIPv4);
 
+// The UUIDs in a text: "root=UUID=12345678-1234-1234-1234-123456789012". The name of an EFI variable ends in one that is the same
+// everywhere, after a hyphen; that one is omitted.
+std::vector<std::string> UuidsIn(std::string_view text);
+
 // The names of home directories in a text: "alice" for "/home/alice/bin".
 std::vector<std::string> HomesIn(std::string_view text);
 

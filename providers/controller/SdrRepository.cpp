@@ -4,7 +4,10 @@
 #include "TBytes.h"
 
 #include <algorithm>
+#include <chrono>
+#include <random>
 #include <set>
+#include <thread>
 
 namespace NQRVZEP20 {
 
@@ -14,7 +17,7 @@ constexpr std::uint8_t kGetInfo = 0x20, kReserve = 0x22, kGetRecord = 0x23;
 constexpr std::uint16_t kFirstRecord = 0x0000, kNoMoreRecords = 0xFFFF;
 constexpr std::size_t kHeader = 5, kMostRecords = 4096, kInfoLength = 14;
 constexpr std::size_t kLongestPart = 64;
-constexpr int kAttempts = 5;  // of a record whose reservation others cancel
+constexpr int kAttempts = 8;  // of a record whose reservation others cancel
 
 void AppendWord(std::string& data, std::uint16_t word) {
   (data += static_cast<char>(word & 0xFF)) += static_cast<char>(word >> 8);
@@ -27,6 +30,12 @@ bool HasTimes(TBytes const& info) {
 
 // The parts of the answer that change with the records: version, number, and the times of the last addition and deletion.
 std::string StateOf(std::string const& info) { return info.substr(0, 3) + info.substr(5, 8); }
+
+// Two programs that read the records at the same time cancel the reservations of each other. Pauses of random length end that.
+void LetOthersRead(int attempt) {
+  static thread_local std::minstd_rand random(std::random_device{}());
+  std::this_thread::sleep_for(std::chrono::milliseconds(random() % (10u << attempt)));
+}
 
 class TReader {
 public:
@@ -42,6 +51,7 @@ public:
       }
       record = WholeRecord(id, next);
       if (record || fIsReserved) return record;
+      LetOthersRead(attempt);
     }
     return record;
   }

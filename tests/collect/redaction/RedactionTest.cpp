@@ -192,5 +192,81 @@ TEST(RedactionTest, CountsTheSecretsOfEachKind) {
   EXPECT_EQ(CountSecrets(document), counts);
 }
 
+TEST(RedactionTest, AddressesAreFoundInEveryNotationOfAMessage) {
+  TJson document = DocumentWith("Message",
+                                "ip=192.0.2.5:192.0.2.1 to 192.0.2.77:8080, 192.0.2.80-192.0.2.90, eth0:192.0.2.91, "
+                                "MAC=52:54:00:aa:bb:01:52:54:00:aa:bb:02:08:00, "
+                                "root=UUID=0a1b2c3d-1111-2222-3333-444455556666");
+  std::string const text = Redacted(document);
+  for (char const* secret : {"192.0.2.", "aa:bb:01", "aa:bb:02", "0a1b2c3d"})
+    EXPECT_THAT(text, testing::Not(testing::HasSubstr(secret))) << secret;
+}
+
+TEST(RedactionTest, OfAUrlTheHostIsASecretAndOfAnAddressNotThePort) {
+  TJson const service = {{"AccessInfo", PropertyOf("string", "https://bmc77.example:8443/redfish")}};
+  TJson document = DocumentWith(InstanceOf("CIM_RemoteServiceAccessPoint", service));
+  document["head"][0] = "bmc77.example answers";
+  std::string const text = Redacted(document);
+  EXPECT_THAT(text, testing::Not(testing::HasSubstr("bmc77")));
+  EXPECT_THAT(text, testing::ContainsRegex("https://address-[0-9]+:8443/redfish"));
+}
+
+TEST(RedactionTest, TheFirstLabelOfADomainIsAWord) {
+  TJson document = DocumentWith("SearchDomains", TJson::array({"dev.example.com"}));
+  document["head"][0] = "/dev/sda of dev.example.com";
+  EXPECT_THAT(Redacted(document), testing::ContainsRegex("/dev/sda of host-[0-9]+\""));
+}
+
+TEST(RedactionTest, TheIdentifierOfAVolumeGroupIsASerial) {
+  std::string const id = "jY6etWf0aBcDeFgHiJkLmNoPqRsTuVwX";
+  TJson document = DocumentWith("InstanceID", "ZEP:pool:" + id);
+  document["head"][0] = "LVM-" + id + "0123456789abcdefghijklmnopqrstuv";
+  EXPECT_THAT(Redacted(document), testing::Not(testing::HasSubstr(id)));
+}
+
+TEST(RedactionTest, OnlyAnObjectPathHidesItsClass) {
+  TJson document = DocumentWith("SerialNumber", "ZX81-77");
+  document["head"][0] = "root/x:ZX81-77 failed";
+  EXPECT_THAT(Redacted(document), testing::Not(testing::HasSubstr("ZX81")));
+}
+
+TEST(RedactionTest, APropertyMayHaveTheNameOfAMember) {
+  TJson document = DocumentWith(InstanceOf(
+      "X_Thing", {{"SerialNumber", PropertyOf("string", "ZX81-77")}, {"thresholds", PropertyOf("string", "of ZX81-77")}}));
+  EXPECT_THAT(Redacted(document), testing::Not(testing::HasSubstr("ZX81")));
+}
+
+TEST(RedactionTest, DescriptionsMayHaveAnotherForm) {
+  TJson document =
+      DocumentWith(InstanceOf("X_Thing", {{"OtherIdentifyingInfo", PropertyOf("string[]", TJson::array({"ZX81-77"}))},
+                                          {"IdentifyingDescriptions", PropertyOf("string", "Serial")}}));
+  EXPECT_THAT(Redacted(document), testing::HasSubstr("ZX81-77"));
+}
+
+TEST(RedactionTest, TheResultOfSendingIsNotOfTheRedaction) {
+  TJson const original = DocumentWith("SerialNumber", "ZX81-77");
+  TPseudonyms pseudonyms("1");
+  TJson document = original;
+  Redact(document, AllKinds(), pseudonyms);
+  document["sent"] = {{"url", "ftp://127.0.0.1/serial-77/"}, {"bytes", 5}};
+  Unredact(document, pseudonyms);
+  EXPECT_EQ(document["sent"]["url"], "ftp://127.0.0.1/serial-77/");
+  document.erase("sent");
+  EXPECT_EQ(document, original);
+}
+
+TEST(RedactionTest, OtherMembersThanThoseOfARedactionAreRefused) {
+  TPseudonyms pseudonyms("1");
+  for (TJson const& redaction : {TJson(3), TJson({{"map", 3}}), TJson({{"kinds", "x"}, {"map", "1"}})}) {
+    TJson document = DocumentWith("SerialNumber", "ZX81-77");
+    document["redaction"] = redaction;
+    EXPECT_THROW(RedactedWith(document), TRedactionError) << redaction;
+    EXPECT_THROW(Unredact(document, pseudonyms), TRedactionError) << redaction;
+  }
+  TJson document = DocumentWith("SerialNumber", "ZX81-77");
+  document["classes"] = {{"a", 1}};
+  EXPECT_THROW(Redact(document, AllKinds(), pseudonyms), TRedactionError);
+}
+
 }  // namespace
 }  // namespace NQRVZEP20

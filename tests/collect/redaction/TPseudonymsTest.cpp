@@ -28,7 +28,14 @@ TEST(TPseudonymsTest, SpellingsShareTheNumberOfTheirValue) {
   EXPECT_EQ(pseudonyms.SpellingOf("address-2"), nullptr);
 }
 
-TEST(TPseudonymsTest, AMapThatIsNotOneIsRefusedByPlace) {
+TEST(TPseudonymsTest, NoPseudonymHasMoreThanNineDigits) {
+  TPseudonyms pseudonyms = TPseudonyms::From(TJson::parse(
+      R"({"document":"zep redaction map","version":1,"map":"1","values":[{"pseudonym":"serial-999999999","value":"A"}]})"));
+  TSecret const serial{ESecretKind::kSerials, "ZX81"};
+  EXPECT_THROW(pseudonyms.For(&serial, "ZX81"), TRedactionError);
+}
+
+TEST(TPseudonymsTest, AnotherDocumentIsRefusedByPlace) {
   struct TRow {
     char const *fMap, *fWhy;
   };

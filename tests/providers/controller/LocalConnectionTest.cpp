@@ -49,7 +49,7 @@ protected:
   }
 
   TController Read() const {
-    constexpr std::chrono::milliseconds limit{200};
+    constexpr std::chrono::milliseconds limit{2000};
     TIpmi const ipmi = WithinTime(InThreads(LocalConnection({fDir.Path("absent"), fDir.Path("ipmi0")}), limit), limit);
     auto const start = std::chrono::steady_clock::now();
     auto controller = ReadController(

@@ -76,7 +76,6 @@ TEST_F(InventoryTest, EventsAgreeWithIpmitool) {
     if (words.find(" going") != std::string::npos) words.insert(words.find(" going"), " -");
     EXPECT_THAT(text, HasSubstr(words));
   }
-  EXPECT_THAT(document.dump(), HasSubstr("Critical"));
 }
 
 // `output` has a line "label : value".

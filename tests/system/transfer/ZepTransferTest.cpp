@@ -1716,6 +1716,7 @@ TEST(ZepReportTest, IsSentCompressed) {
   TProgramRun const run = RunProgram(command + " < /dev/null 2>&1 > " + dir.Path("printed"));
   EXPECT_EQ(run.fExitCode, RunProgram(kZep + "report --sample > /dev/null").fExitCode) << run.fOutput;
   EXPECT_THAT(run.fOutput, testing::MatchesRegex(
+                               "zep: the report contains [0-9]+ serials, 1 host, 0 addresses and 0 users, not redacted\n"
                                "zep: sent to sftp://zep@127.0.0.1:[0-9]+/zep-report-sample-server-[0-9]{8}T[0-9]{6}Z.json.gz: "
                                "[0-9]+ bytes, SHA-256 [0-9a-f]{64}\n"));
   EXPECT_THAT(ReadFile(dir.Path("printed")), HasSubstr("SAMPLE Identity"));

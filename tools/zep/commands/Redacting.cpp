@@ -44,6 +44,17 @@ std::string NamesOf(TKinds const& kinds) {
   return Joined(names, ", ");
 }
 
+// A report that is redacted already must have no secrets of the wanted kinds.
+void CheckRedaction(TRedactedWith const& with, TKinds const& wanted, std::string const& map, std::string const& mapFile) {
+  if (with.fMap != map) throw TFailure(kExitNoInput, "the report was redacted with another map than " + mapFile);
+  TKinds missing;
+  for (ESecretKind const kind : wanted)
+    if (std::find(with.fKinds.begin(), with.fKinds.end(), kind) == with.fKinds.end()) missing.push_back(kind);
+  if (missing.empty()) return;
+  throw TFailure(kExitNoInput, "the report was redacted without " + NamesOf(missing) +
+                                   "; give the original back with zep unredact, and redact that");
+}
+
 }  // namespace
 
 void AddRedactionOptions(CLI::App& command, TRedactionArguments& arguments) {
@@ -66,11 +77,12 @@ void AddRedactionOptions(CLI::App& command, TRedactionArguments& arguments) {
 void RedactDocument(TJson& document, TRedactionArguments const& arguments) {
   std::string const file = arguments.fMapFile.empty() ? UsualRedactionMap() : arguments.fMapFile;
   TRedactionMap map(file);
-  if (IsRedacted(document)) {
-    if (document["redaction"].value("map", "") == map.Pseudonyms().Id()) return;
-    throw TFailure(kExitNoInput, "the report was redacted with another map than " + file);
+  try {
+    if (IsRedacted(document)) return CheckRedaction(RedactedWith(document), arguments.fKinds, map.Pseudonyms().Id(), file);
+    Redact(document, arguments.fKinds, map.Pseudonyms());
+  } catch (TRedactionError const& failure) {
+    throw TFailure(kExitNoInput, "the report cannot be redacted: " + std::string(failure.what()));
   }
-  Redact(document, arguments.fKinds, map.Pseudonyms());
   map.Save();
   std::cerr << "zep: the redaction map is " << Printable(file) << "\n";
 }

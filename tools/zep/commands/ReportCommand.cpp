@@ -2,6 +2,7 @@
 
 // zep report: which machine this is.
 
+#include "collect/FailureOf.h"
 #include "collect/Report.h"
 #include "collect/redaction/Redaction.h"
 #include "collect/stored/StoredDocument.h"
@@ -91,7 +92,8 @@ TJson WriteToMedium(TMadeReport const& made, TArguments const& arguments) {
   std::vector<std::string> const stillMountedAt = WriteAndUnmount(medium, name, text);
   ThrowIfInterrupted(name + " was written to " + medium.Device() + ", which " + RemovalText(stillMountedAt));
 
-  TJson document = DocumentHead(kToMedia, ExitStatusOf(report.fCompleteness), WhyNotComplete(report), SampleLabelOf(report));
+  TJson document = DocumentHead(kToMedia, ExitStatusOf(report.fCompleteness), "", SampleLabelOf(report));
+  document["reason"] = contents.Members().at("reason");  // which may be redacted
   document["device"] = medium.Device();
   document["file"] = name;
   document["bytes"] = text.size();
@@ -124,9 +126,12 @@ std::optional<TFailure> WritePage(TMadeReport const& made, TArguments const& arg
 // Prints the number of secrets in the report, and asks on a terminal whether it is to be sent.
 bool IsSendingConfirmed(TReport const& report, TTarget const& target, TArguments const& arguments) {
   TReportDocument document(report, EMessages::kVerbatim);
-  document.ReadInstances();
-  std::string const contents = ContentsText(CountSecrets(std::move(document.Members())), arguments.fRedaction.fKinds);
-  if (!arguments.fOptions.fQuiet) std::cerr << "zep: the report contains " << contents << "\n";
+  std::string const failure = FailureOf([&] {
+    document.ReadInstances();
+    std::string const contents = ContentsText(CountSecrets(std::move(document.Members())), arguments.fRedaction.fKinds);
+    if (!arguments.fOptions.fQuiet) std::cerr << "zep: the report contains " << contents << "\n";
+  });
+  if (!failure.empty()) std::cerr << "zep: the secrets in the report cannot be counted: " << Printable(failure) << "\n";
   return arguments.fIsConfirmed || IsConfirmed("zep: send it to " + target.fRemote.fHost + "?");
 }
 
