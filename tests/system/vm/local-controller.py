@@ -21,6 +21,7 @@ FRU = {"chassis": {"Chassis Part Number": "PartNumber", "Chassis Serial": "Seria
 # The documents, and the rules that must find a problem in them. Without a clock, the age of events is unknown.
 FAULTS = {"healthy": [], "compared": ["event-log-critical"], "faults": ["event-log-full", "controller-clock"], "mended": []}
 REMEDIES = {"event-log-critical": "sel clear", "event-log-full": "sel save", "controller-clock": "sel time set"}
+USUAL = {"controller-account": "not-asked"}  # QEMU's controller has no accounts
 RULES = [*REMEDIES, "sensor-threshold", "fan-stopped", "controller-part-failed", "controller-account"]
 
 
@@ -157,7 +158,7 @@ def check_findings(run):
         findings = json.loads((run.directory / f"{name}.json").read_text())["findings"]
         outcomes = {rule["id"]: rule["outcome"] for rule in findings["rules"]}
         for rule in RULES:
-            run.expect(f"{name}: {rule}", "wrong" if rule in faults else "fine", outcomes[rule])
+            run.expect(f"{name}: {rule}", "wrong" if rule in faults else USUAL.get(rule, "fine"), outcomes[rule])
         if not faults:
             run.expect(f"{name}: problems", [], [each["reason"] for each in findings["problems"]])
         for problem in findings["problems"]:
