@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 
-// Reads any bytes as the map of a redacted report, and redacts them as a text: the original comes back unchanged.
+// Reads any bytes as the map of a redacted report, and redacts them as a text, which must then be restored unchanged.
 
 #include "collect/redaction/TPseudonyms.h"
 #include "fuzz/Require.h"

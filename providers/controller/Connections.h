@@ -25,8 +25,8 @@ TIpmi SessionConnection(TZepController const& controller);
 // Sends no command after `limit`, or after one that was not answered: each of them would take its own time.
 TIpmi WithinTime(TIpmi ipmi, std::chrono::steady_clock::duration limit);
 
-// Sends each command by a thread of its own, for a library that may hang. When `ipmi` has not returned by the limit, it is left
-// behind with its thread, and a copy of it remains until the process ends; send no further command then (WithinTime).
+// Sends each command by a thread of its own, for a library that may hang. When `ipmi` has not returned by the limit, its
+// thread and a copy of it remain until the process ends; send no further command then (WithinTime).
 TIpmi InThreads(TIpmi ipmi, std::chrono::steady_clock::duration limit);
 
 // The recorded answers below the root of `files`, or those of `ipmi`, which are recorded if ZEP_RECORD_ANSWERS is set

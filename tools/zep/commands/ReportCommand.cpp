@@ -298,7 +298,7 @@ TRun AddReportArguments(CLI::App& command) {
       .add_option("--html", arguments->fHtmlFile,
                   "Write the report as a page to this file, which needs no other file, instead of printing it as text")
       ->type_name("FILE");
-  command.add_flag("--yes", arguments->fIsConfirmed, "Send without asking on the terminal");
+  command.add_flag("--yes", arguments->fIsConfirmed, "Send without a question on the terminal");
   AddUploadOptions(command, arguments->fOptions);
   AddRedactionOptions(command, arguments->fRedaction);
   AddPlugInOptions(command, arguments->fPlugIns);
