@@ -15,7 +15,7 @@ namespace NQRVZEP20 {
 std::vector<std::string> LocalDevices();
 
 // The controller of this machine, through the first device that exists, and libfreeipmi. The first command opens the device. Each
-// command fails with the reason if there is no device. The returned function owns the open device; call it from one thread at a
+// command fails with the reason if none exists. The returned function owns the open device; call it from one thread at a
 // time. A command blocks as long as the driver does: see InThreads.
 TIpmi LocalConnection(std::vector<std::string> const& devices = LocalDevices());
 
