@@ -113,7 +113,9 @@ TSecretIndex::TSpelling const* TSecretIndex::LongestAt(std::string_view text, st
   if (found == fSpellings.end()) return nullptr;
   for (TSpelling const& spelling : found->second) {
     std::size_t const first = begin - spelling.fPrefix, size = spelling.fText.size();
-    if (begin - from < spelling.fPrefix || first + size > text.size() || !IsWordBound(text, first, first + size)) continue;
+    bool const isFree = begin - from >= spelling.fPrefix;
+    bool const touches = from > 0 && first == from;  // the pseudonyms would join to one word: "user-1user-2"
+    if (!isFree || touches || first + size > text.size() || !IsWordBound(text, first, first + size)) continue;
     if (IsSame(text.substr(first, size), spelling.fText, spelling.fIsExact)) return &spelling;
   }
   return nullptr;
