@@ -21,7 +21,7 @@ public:
   bool Check(int depth, TJson::parse_event_t event) {
     constexpr int deepest = 16;
     constexpr std::size_t mostMembers = 2000;
-    if (depth >= deepest) throw TStoredReportError("the document is nested too deeply for a report");
+    if (depth >= deepest) throw TStoredReportError("the document is nested too deeply");
     std::size_t& members = fMembers[depth];
     if (event == TJson::parse_event_t::object_start) fMembers[depth + 1] = 0;
     if (event == TJson::parse_event_t::key && ++members > mostMembers)
@@ -32,6 +32,11 @@ public:
 private:
   std::size_t fMembers[32] = {};
 };
+
+TJson BoundedJson(std::string_view text) {
+  TBounds bounds;
+  return TJson::parse(text, [&](int depth, TJson::parse_event_t event, TJson&) { return bounds.Check(depth, event); });
+}
 
 // "line 3, column 9: syntax error while parsing value - unexpected end of input": the message without the number of the exception
 // and without the text of the file, which may be a password.
@@ -53,9 +58,8 @@ bool IsLines(std::string const& text) {
 TJson Parsed(std::string const& text) {
   constexpr std::string_view gzip = "\x1f\x8b";
   if (text.compare(0, gzip.size(), gzip) == 0) throw TStoredReportError("it is compressed; gunzip it first");
-  TBounds bounds;
   try {
-    return TJson::parse(text, [&](int depth, TJson::parse_event_t event, TJson&) { return bounds.Check(depth, event); });
+    return BoundedJson(text);
   } catch (TJson::exception const& failure) {
     throw TStoredReportError(IsLines(text) ? kLines : WhyNotJson(failure));
   }
@@ -102,6 +106,14 @@ auto WithName(std::string const& name, TRead read) {
 }
 
 }  // namespace
+
+TStoredDocument ParsedWithinBounds(std::string_view text) {
+  try {
+    return BoundedJson(text);
+  } catch (TJson::exception const& failure) {
+    throw TStoredReportError(WhyNotJson(failure));
+  }
+}
 
 TStoredDocument StoredDocumentFrom(std::string const& text, std::string const& name) {
   return WithName(name, [&] {

@@ -6,6 +6,7 @@
 #include <nlohmann/json.hpp>
 
 #include <string>
+#include <string_view>
 
 namespace NQRVZEP20 {
 
@@ -14,6 +15,10 @@ using TStoredDocument = nlohmann::ordered_json;
 
 // The version of the documents that this library reads.
 constexpr int kStoredVersion = 2;
+
+// Parses a JSON document. Throws TStoredReportError if it is none, or has objects with more members, or deeper nested ones, than
+// the documents of zep, which would take memory or time.
+TStoredDocument ParsedWithinBounds(std::string_view text);
 
 // Parses a document and checks that it is one of a report, in that version; its parts are checked by StoredReportOf. Throws
 // TStoredReportError.

@@ -636,7 +636,7 @@ TEST_F(ZepTransferTest, AFileSystemWithoutLocksIsNamed) {
     EXPECT_THAT(output, testing::StartsWith("73zep: "));
     EXPECT_THAT(output,
                 EndsWith(": " + fDir.Path("f.part.lock") + " cannot be locked: " + std::generic_category().message(error) +
-                         "; its file system does not support locks: fetch to another directory\n"));
+                         "; its file system does not support locks: use another directory\n"));
   }
 }
 
@@ -1165,7 +1165,7 @@ TEST_F(ZepTransferTest, OnlyOneDownloadAtATimeWritesAFile) {
   EXPECT_TRUE(IsTrueSoon([&] { return HasSize(part, 100000); }));
   TProgramRun const second = Zep("get " + Url("f") + " " + file);
   EXPECT_EQ(second.fExitCode, kNotWritten);
-  EXPECT_THAT(second.fOutput, EndsWith("/f, " + part + ": another transfer into the file is running\n"));
+  EXPECT_THAT(second.fOutput, EndsWith("/f, " + part + ": another zep is using the file; try again when it has ended\n"));
   EXPECT_EQ(OpenFlagsOf(part + ".lock") & O_ACCMODE, O_RDWR) << "NFS locks only files that are open for writing";
   relay.Stop();
   running.join();

@@ -7,6 +7,7 @@
 
 #include <fcntl.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <cerrno>
 #include <cstdio>
@@ -17,8 +18,6 @@
 namespace NQRVZEP20::zep {
 
 namespace {
-
-constexpr std::size_t kMostBytes = 1 << 20;
 
 std::string Octal(mode_t mode) {
   char text[16];
@@ -39,25 +38,34 @@ ssize_t ReadNext(int file, TSecretBytes& chunk) {
 
 }  // namespace
 
-TPrivateFile::TPrivateFile(std::string const& path) : fPath(path) {
+TPrivateFile::TPrivateFile(std::string const& path, std::size_t mostBytes) : fPath(path), fMostBytes(mostBytes) {
   TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC | O_NOCTTY));
   struct stat status {};
-  if (file && ::fstat(file.get(), &status) == 0) fMode = status.st_mode;
+  if (file && ::fstat(file.get(), &status) == 0) {
+    fMode = status.st_mode;
+    fOwner = status.st_uid;
+  }
   TSecretBytes chunk(4096);
   ssize_t got = file ? 1 : -1;
-  while (got > 0 && fText.size() <= kMostBytes) {
+  while (got > 0 && fText.size() <= fMostBytes) {
     got = ReadNext(file.get(), chunk);
     if (got > 0) fText.insert(fText.end(), chunk.begin(), chunk.begin() + got);
   }
   if (got < 0)
     fError = errno;
-  else if (fText.size() > kMostBytes)
+  else if (fText.size() > fMostBytes)
     fError = EFBIG;
   if (fError != 0) fText = {};
 }
 
 std::string TPrivateFile::Reason() const {
-  return fError == EFBIG ? "it is longer than " + ExactSizeText(kMostBytes) : std::generic_category().message(fError);
+  return fError == EFBIG ? "it is longer than " + ExactSizeText(fMostBytes) : std::generic_category().message(fError);
+}
+
+std::string TPrivateFile::WhyNotPrivate() const {
+  if (!S_ISREG(fMode)) return "";
+  if (fOwner != ::geteuid()) return "it belongs to another user; copy it to a file of your own";
+  return (fMode & (S_IRWXG | S_IRWXO)) == 0 ? "" : "other users can read or change it; chmod 600 makes it private";
 }
 
 void TPrivateFile::WarnWhenOthersMayRead() const {

@@ -5,13 +5,12 @@
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/OutputFile.h"
+#include "tools/zep/output/Text.h"
+#include "tools/zep/secrets/PrivateFile.h"
 #include "tools/zep/transfer/Sha256.h"
 
 #include <sys/random.h>
-#include <sys/stat.h>
-#include <unistd.h>
 
-#include <cerrno>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
@@ -23,6 +22,8 @@ namespace NQRVZEP20::zep {
 namespace {
 
 namespace fs = std::filesystem;
+
+constexpr std::size_t kMostBytes = 16 << 20;  // of a map, which gains a hundred bytes with each secret
 
 std::string Variable(char const* name) {
   char const* const value = std::getenv(name);
@@ -46,15 +47,8 @@ std::string NewId() {
 
 std::string ChecksumOf(TJson const& document) { return Sha256OfText(AsVerbatimLine(document["values"])); }
 
-void RefuseIfOthersMayRead(std::string const& file) {
-  struct stat status {};
-  if (::stat(file.c_str(), &status) == 0 && (status.st_mode & (S_IRWXG | S_IRWXO)) != 0)
-    throw TRedactionError("other users can read it; chmod 600 makes it private");
-}
-
-TPseudonyms MapFrom(std::string const& text) {
-  TJson const document = TJson::parse(text, nullptr, false);
-  if (document.is_discarded()) throw TRedactionError("it is cut, or is not a redaction map of zep");
+TPseudonyms MapFrom(std::string_view text) {
+  TJson const document = ParsedWithinBounds(text);
   TPseudonyms pseudonyms = TPseudonyms::From(document);
   if (document.value("sha256", TJson()) != ChecksumOf(document))
     throw TRedactionError("/sha256: does not match the values; it was altered");
@@ -71,11 +65,9 @@ std::string WithDirectory(std::string const& file) {
 }
 
 TPseudonyms MapIn(std::string const& file, TLockFile const& lock) {
+  std::string const& why = lock.WhyNotHeld();
+  if (!why.empty()) throw TFailure(kExitNotWritten, file + " cannot be written: " + why + " (--redaction-map names another map)");
   std::error_code ignored;
-  fs::path const directory = fs::path(file).parent_path();
-  bool const isWritable = ::access(directory.empty() ? "." : directory.c_str(), W_OK) == 0;
-  std::string const why = isWritable ? "another zep is using it; try again" : std::generic_category().message(errno);
-  if (!lock.WhyNotHeld().empty()) throw TFailure(kExitNotWritten, file + " cannot be written: " + why);
   return fs::exists(file, ignored) ? ReadRedactionMap(file) : TPseudonyms(NewId());
 }
 
@@ -85,13 +77,14 @@ std::string UsualRedactionMap() { return StateDirectory() + "/redaction-map.json
 
 TPseudonyms ReadRedactionMap(std::string const& file) {
   try {
-    RefuseIfOthersMayRead(file);
-    std::string const text = ReadStoredText(file);
-    return MapFrom(text);
+    TPrivateFile const contents(file, kMostBytes);
+    if (contents.Error() != 0) throw TRedactionError(contents.Reason());
+    if (std::string const why = contents.WhyNotPrivate(); !why.empty()) throw TRedactionError(why);
+    return MapFrom(contents.Text());
   } catch (TRedactionError const& failure) {
     throw TFailure(kExitNoInput, file + ": " + failure.what());
   } catch (TStoredReportError const& failure) {
-    throw TFailure(kExitNoInput, failure.what());
+    throw TFailure(kExitNoInput, file + ": " + failure.what());
   }
 }
 
@@ -101,7 +94,11 @@ TRedactionMap::TRedactionMap(std::string const& file)
 void TRedactionMap::Save() const {
   TJson document = fPseudonyms.AsJson();
   document["sha256"] = ChecksumOf(document);
-  WritePrivateFile(fFile, AsVerbatimText(document));
+  std::string const text = AsVerbatimText(document);
+  if (text.size() > kMostBytes)
+    throw TFailure(kExitNotWritten,
+                   fFile + " would be longer than " + ExactSizeText(kMostBytes) + "; begin another map with --redaction-map");
+  WritePrivateFile(fFile, text);
 }
 
 }  // namespace NQRVZEP20::zep

@@ -14,8 +14,8 @@ namespace NQRVZEP20::zep {
 // is not set. Throws TWrongUsage if HOME is not set either.
 std::string UsualRedactionMap();
 
-// Reads a map. Throws TFailure with kExitNoInput, and with the name of the file and the place, if it cannot be read, is readable
-// by others, is cut or altered, or is not a map.
+// Reads a map of at most 16 MiB. Throws TFailure with kExitNoInput, and with the name of the file and the place, if it cannot be
+// read, belongs to another user or is accessible to others, is cut or altered, or is not a map.
 TPseudonyms ReadRedactionMap(std::string const& file);
 
 // A map that is used for redacting: it is read if it exists, and written with Save. While an object exists, other processes
@@ -28,7 +28,7 @@ public:
 
   TPseudonyms& Pseudonyms() { return fPseudonyms; }
 
-  // Throws like WriteOutputFile.
+  // Throws like WriteOutputFile, also if the map has become longer than ReadRedactionMap reads.
   void Save() const;
 
 private:

@@ -54,10 +54,10 @@ bool TLockFile::IsStillThere() const {
 }
 
 std::string TLockFile::WhyNotLocked(int error) const {
-  if (error == EWOULDBLOCK) return "another transfer into the file is running";
+  if (error == EWOULDBLOCK) return "another zep is using the file; try again when it has ended";
   bool const isUnsupported = error == EBADF || error == ENOLCK || error == EOPNOTSUPP;
   return Printable(fPath) + " cannot be locked: " + ReasonOf(error) +
-         (isUnsupported ? "; its file system does not support locks: fetch to another directory" : "");
+         (isUnsupported ? "; its file system does not support locks: use another directory" : "");
 }
 
 }  // namespace NQRVZEP20::zep

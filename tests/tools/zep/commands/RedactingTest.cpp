@@ -8,6 +8,8 @@
 
 #include <gmock/gmock.h>
 
+#include <sys/file.h>
+
 #include <algorithm>
 #include <cctype>
 #include <cstdio>
@@ -243,20 +245,57 @@ TEST_F(RedactingTest, ACutAlteredOrForeignFileIsRefusedByNameAndPlace) {
     return run.fErrors;
   };
   Write("other", map.substr(0, map.size() / 2));
-  EXPECT_EQ(whyRefused("redacted.json", "other"), "zep: other: it is cut, or is not a redaction map of zep\n");
+  EXPECT_THAT(whyRefused("redacted.json", "other"), testing::StartsWith("zep: other: line "));
   Write("other", WithReplaced(map, "\"KQ12345\"", "\"KQ12346\""));
   EXPECT_EQ(whyRefused("redacted.json", "other"), "zep: other: /sha256: does not match the values; it was altered\n");
   Write("other", redacted);
   EXPECT_EQ(whyRefused("redacted.json", "other"), "zep: other: it is not a redaction map of zep\n");
-  EXPECT_EQ(whyRefused("redacted.json", "none"), "zep: none: no such file\n");
+  EXPECT_EQ(whyRefused("redacted.json", "none"), "zep: none: No such file or directory\n");
   EXPECT_EQ(whyRefused("a.json", "map"), "zep: a.json: it is not redacted\n");
   Write("altered.json", WithReplaced(redacted, "serial number serial-1", "serial number serial-999"));
   EXPECT_THAT(whyRefused("altered.json", "map"), HasSubstr("zep: altered.json: /head/0: serial-999 is not in the map\n"));
   Write("cut.json", redacted.substr(0, 900));
   EXPECT_THAT(whyRefused("cut.json", "map"), testing::StartsWith("zep: cut.json: line "));
-  fs::permissions(fZep.Path("map"), fs::perms::others_read, fs::perm_options::add);
-  EXPECT_EQ(whyRefused("redacted.json", "map"), "zep: map: other users can read it; chmod 600 makes it private\n");
-  EXPECT_EQ(Run({"report", "--sample", "--redact", "--redaction-map", "map"}).fStatus, 66);
+}
+
+TEST_F(RedactingTest, AMapOfOthersIsRefused) {
+  Write("redacted.json", OutputOf({"report", "--sample", "--redact", "--redaction-map", "map", "--json"}));
+  std::string const map = fZep.Path("map");
+  auto const expectRefused = [&](std::string const& why) {
+    for (std::vector<std::string> const& call : {std::vector<std::string>{"unredact", "redacted.json", "--map", "map"},
+                                                 {"report", "--sample", "--redact", "--redaction-map", "map"}}) {
+      TRun const run = Run(call);
+      EXPECT_EQ(run.fStatus, 66);
+      EXPECT_EQ(run.fErrors, "zep: map: " + why + "\n");
+    }
+  };
+  for (fs::perms const right : {fs::perms::others_read, fs::perms::group_write}) {
+    fs::permissions(map, right, fs::perm_options::add);
+    expectRefused("other users can read or change it; chmod 600 makes it private");
+    fs::permissions(map, right, fs::perm_options::remove);
+  }
+  fs::resize_file(map, (16 << 20) + 1);
+  expectRefused("it is longer than 16 MiB");
+  if (::geteuid() != 0) GTEST_SKIP() << "only root can give a file to another user";
+  ASSERT_EQ(::chown(map.c_str(), 65534, 65534), 0);
+  fs::resize_file(map, 10);
+  expectRefused("it belongs to another user; copy it to a file of your own");
+}
+
+TEST_F(RedactingTest, AMapThatIsInUseIsNamedWithTheRemedy) {
+  std::vector<std::string> const call = {"report", "--sample", "--redact", "--redaction-map", "map"};
+  int const lock = ::open(fZep.Path("map.lock").c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600);
+  ASSERT_EQ(::flock(lock, LOCK_EX), 0);
+  TRun const run = Run(call);
+  EXPECT_EQ(run.fStatus, 73);
+  EXPECT_EQ(run.fErrors,
+            "zep: map cannot be written: another zep is using the file; try again when it has ended (--redaction-map names "
+            "another map)\n");
+  ::close(lock);
+  OutputOf(call);
+  fs::create_directory(fZep.Path("map.lock"));
+  EXPECT_EQ(Run(call).fErrors,
+            "zep: map cannot be written: map.lock cannot be opened: Is a directory (--redaction-map names another map)\n");
 }
 
 // The report that is kept when it cannot be sent is the one that would have been sent.
