@@ -111,6 +111,20 @@ bool IsJudged(std::string const& sensorType) {
   return std::any_of(std::begin(types), std::end(types), [&](char const* type) { return sensorType.rfind(type, 0) == 0; });
 }
 
+// Whether the event log records that the part was removed. A bay that was never used has no such entry.
+bool WasRemoved(TRuleRun const& run, std::string const& part) {
+  std::string const removal = part + ": Presence detected, deasserted";
+  auto const entries = run.TryElements("ZEP_EventLogEntry");
+  return std::any_of(entries.begin(), entries.end(), [&](TElement const& entry) {
+    auto const text = entry.Text("RecordData");
+    return text.IsKnown() && text.fValue->rfind(removal, 0) == 0;
+  });
+}
+
+bool IsMissingSupply(TRuleRun const& run, TElement const& sensor, std::string const& type, std::string const& state) {
+  return type == "Power Supply" && state.find("Presence detected") == std::string::npos && WasRemoved(run, sensor.Label());
+}
+
 void AskStates(TRuleRun& run) {
   constexpr char const* error = "6";
   for (TElement const& sensor : OfController(run, "CIM_Sensor")) {
@@ -123,6 +137,10 @@ void AskStates(TRuleRun& run) {
       run.Add(sensor, state.fSource, ESeverity::kError,
               "the controller reports a failure of " + sensor.Label() + " (" + *type.fValue + "): " + *state.fValue,
               "Check the part and its connections, and replace it.");
+    else if (IsMissingSupply(run, sensor, *type.fValue, *state.fValue))
+      run.Add(sensor, state.fSource, ESeverity::kError,
+              "the power supply " + sensor.Label() + " is missing: the controller's event log records its removal",
+              "Insert it again. If it was removed on purpose, clear the event log (ipmitool sel clear).");
   }
 }
 

@@ -117,6 +117,23 @@ TEST(ControllerRulesTest, AFailedPartIsNamed) {
   EXPECT_THAT(Problems(rule, Sensor("System ACPI Power State", error)), IsEmpty());
 }
 
+TEST(ControllerRulesTest, APowerSupplyThatWasRemovedIsMissing) {
+  auto const supply = [](char const* type, char const* state) {
+    return OnController(std::string("instance of CIM_Sensor { DeviceID = \"s\"; ElementName = \"PSU 1\"; CurrentState = \"") +
+                        state + "\"; OtherSensorTypeDescription = \"" + type + "\"; OperationalStatus = {0}; };");
+  };
+  auto const logged = [](char const* text) {
+    return std::string("instance of ZEP_EventLogEntry { RecordID = \"1\"; RecordData = \"") + text + "\"; };";
+  };
+  std::string const rule = "controller-part-failed", removal = logged("PSU 1: Presence detected, deasserted");
+  EXPECT_THAT(Problems(rule, supply("Power Supply", "none") + removal),
+              ElementsAre("error: the power supply PSU 1 is missing: the controller's event log records its removal"));
+  EXPECT_THAT(Problems(rule, supply("Power Supply", "Presence detected") + removal), IsEmpty()) << "inserted again";
+  EXPECT_THAT(Problems(rule, supply("Power Supply", "none")), IsEmpty()) << "the bay was never used";
+  EXPECT_THAT(Problems(rule, supply("Power Supply", "none") + logged("PSU 12: Presence detected, deasserted")), IsEmpty());
+  EXPECT_THAT(Problems(rule, supply("Drive Slot", "none") + removal), IsEmpty());
+}
+
 TEST(ControllerRulesTest, AMachineWithoutAControllerIsFine) {
   for (TRule const& rule : ControllerRules()) {
     EXPECT_THAT(Problems(rule.fId, ""), IsEmpty()) << rule.fId;

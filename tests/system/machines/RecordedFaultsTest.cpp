@@ -268,10 +268,16 @@ TEST_F(RecordedFaultsTest, OfTheManagementController) {
   WriteFile(Path(kIpmi + "0644-0102"), Bytes({0, 2, 0x42, 0, 0x14}));
   WriteFile(Path(kIpmi + "0646-01"), Bytes({0}) + std::string(16, '\0'));
   WriteFile(Path(kIpmi + "0646-02"), Bytes({0}) + "support" + std::string(9, '\0'));
+  std::string const removal = Bytes({0, 0xFF, 0xFF, 0, 0, 2, 0x23, 0x72, 3, 0x6B, 0x20, 0, 4, 8, 3, 0xEF, 0, 0xFF, 0xFF});
   TRow const rows[] = {
       {"error sensor-threshold", "air flow", {{kIpmi + "042d-01", Content(Bytes({0, 91, 0xC0, 0x18}))}}},
       {"error fan-stopped", "Replace the fan", {{kIpmi + "042d-02", Content(Bytes({0, 0, 0xC0, 0x07}))}}},
       {"error controller-part-failed", "replace it", {{kIpmi + "042d-03", Content(Bytes({0, 0, 0xC0, 3, 0}))}}},
+      {"error controller-part-failed",
+       "Insert it again",
+       {{kIpmi + "042d-03", Content(Bytes({0, 0, 0xC0, 0, 0}))},
+        {kIpmi + "0a40-", Patched(2, Bytes({1, 0}))},
+        {kIpmi + "0a43-0000000000ff", Content(removal)}}},
       {"error event-log-critical", "ipmitool sel clear", {{kIpmi + "0a40-", Content(info)}}},
       {"warning event-log-full", "ipmitool sel save", {{kIpmi + "0a40-", Patched(4, Bytes({0, 0}))}}},
       {"warning controller-clock", "ipmitool sel time set", {{kIpmi + "0a48-", Content(Bytes({0, 9, 0, 0, 0}))}}},
