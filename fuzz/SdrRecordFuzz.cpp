@@ -20,7 +20,7 @@ extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size
   for (unsigned state = 0; state < 16; ++state)
     Require(!StateName(record.fSensor->fType, record.fSensor->fReadingType, state).empty());
   Require(!SensorTypeName(record.fSensor->fType).empty());
-  UnitName(record.fSensor->fUnit);
+  UnitText(record.fSensor->fUnit);
   SeverityOfStates(*record.fSensor, 0x7FFF);
   return 0;
 }

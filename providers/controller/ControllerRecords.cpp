@@ -176,6 +176,8 @@ TRecord NumericSensorRecord(TSensorState const& state, TComputerSystem const& sy
   record.Add("BaseUnits", Known(numbers.fBaseUnits)).Names(kBaseUnitsNames);
   record.Add("UnitModifier", Known(numbers.fUnitModifier));
   record.SetSource("IPMI Get Sensor Thresholds");
+  record.Add("RateUnits", numbers.fRateUnits).Names(kRateUnitsNames);
+  record.Add("Description", UnitDescriptionOf(state.fSensor));
   record.Add("LowerThresholdNonCritical", threshold(TRawThresholds::kLowerNonCritical));
   record.Add("UpperThresholdNonCritical", threshold(TRawThresholds::kUpperNonCritical));
   record.Add("LowerThresholdCritical", threshold(TRawThresholds::kLowerCritical));

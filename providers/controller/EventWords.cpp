@@ -65,7 +65,7 @@ std::string ReadingText(TSelEntry const& entry, TSdrSensor const& sensor) {
   if (entry.fEventType != kThresholdReading || !hasReading || !reading) return "";
   std::string text = "; reading " + NumberText(*reading);
   if (hasThreshold && threshold) text += ", threshold " + NumberText(*threshold);
-  std::string const unit = UnitName(sensor.fUnit);
+  std::string const unit = UnitText(sensor.fUnit);
   return unit.empty() ? text : text + " " + unit;
 }
 
@@ -86,7 +86,13 @@ std::string SensorTypeName(std::uint8_t sensorType) {
   return "sensor type 0x" + HexText(std::string(1, static_cast<char>(sensorType)));
 }
 
-std::string UnitName(std::uint8_t unit) { return unit != 0 && IPMI_SENSOR_UNIT_VALID(unit) ? ::ipmi_sensor_units[unit] : ""; }
+std::string UnitText(TSensorUnit const& unit) {
+  if (unit.fBase == 0 && !unit.fIsPercentage) return "";
+  return TextOf([&](char* buffer, unsigned size) {
+    return ::ipmi_sensor_units_string(unit.fIsPercentage ? 1 : 0, unit.fModifier, unit.fRate, unit.fBase, unit.fSecond, buffer,
+                                      size, 0);
+  });
+}
 
 std::string MakerName(std::uint32_t manufacturerId) {
   return TextOf([&](char* buffer, unsigned size) { return ::ipmi_iana_enterprise_numbers_string(manufacturerId, buffer, size); });

@@ -18,8 +18,8 @@ enum class EEventSeverity : std::uint16_t { kUnknown = 0, kInformation = 2, kWar
 // "Temperature"; "OEM Reserved" or "sensor type 0xd0" for types without a name.
 std::string SensorTypeName(std::uint8_t sensorType);
 
-// "degrees C"; empty if there is none.
-std::string UnitName(std::uint8_t unit);
+// "degrees C", "packets per s", "%"; empty if there is none, or the tables lack it.
+std::string UnitText(TSensorUnit const& unit);
 
 // The name of the maker; empty if it is unknown.
 std::string MakerName(std::uint32_t manufacturerId);

@@ -40,6 +40,12 @@ TSensorScale ScaleOf(TBytes const& record) {
           static_cast<std::int8_t>(Signed(exponents & 0x0FU, 4))};
 }
 
+TSensorUnit UnitOf(TBytes const& record) {
+  std::uint8_t const kinds = record.At(20);
+  return {(kinds & 1) != 0, record.At(21), static_cast<std::uint8_t>(kinds >> 1 & 3), record.At(22),
+          static_cast<std::uint8_t>(kinds >> 3 & 7)};
+}
+
 TRawThresholds ThresholdsOf(TBytes const& record) {
   return {static_cast<std::uint8_t>(record.At(18) & 0x3F),
           {record.At(41), record.At(40), record.At(39), record.At(38), record.At(37), record.At(36)}};
@@ -60,13 +66,12 @@ TSdrSensor SensorOf(TBytes const& record, TSdrSensor::EKind kind) {
 
 // Full records of sensors with states often have zeros instead of the mark for "no number".
 bool HasNumber(TSdrSensor const& sensor) {
-  return sensor.fReadingType == kThresholdReading || sensor.fIsPercentage || sensor.fUnit != 0;
+  return sensor.fReadingType == kThresholdReading || sensor.fUnit.fIsPercentage || sensor.fUnit.fBase != 0;
 }
 
 TSdrSensor FullSensor(TBytes const& record) {
   TSdrSensor sensor = SensorOf(record, TSdrSensor::EKind::kFull);
-  sensor.fIsPercentage = (record.At(20) & 1) != 0;
-  sensor.fUnit = record.At(21);
+  sensor.fUnit = UnitOf(record);
   if (HasNumber(sensor)) sensor.fScale = ScaleOf(record);
   if (sensor.fReadingType == kThresholdReading) sensor.fThresholds = ThresholdsOf(record);
   sensor.fName = NameAt(record, 47);

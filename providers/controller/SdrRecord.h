@@ -32,6 +32,16 @@ struct TRawThresholds {
 
 constexpr std::uint8_t kThisController = 0x20;  // the address of the controller that is read
 
+// The unit of the readings, in the numbers of IPMI.
+struct TSensorUnit {
+  enum EModifier : std::uint8_t { kNone, kDivided, kMultiplied };
+
+  bool fIsPercentage = false;
+  std::uint8_t fBase = 0;               // 0: unspecified
+  std::uint8_t fModifier = kNone;       // how the second unit changes the first one
+  std::uint8_t fSecond = 0, fRate = 0;  // rate: 0 none, 1 per microsecond, … 6 per day
+};
+
 constexpr std::uint8_t kThresholdReading = 1;  // the reading type of sensors with thresholds
 
 // A sensor of the repository of sensor data records (SDR).
@@ -41,8 +51,7 @@ struct TSdrSensor {
   EKind fKind = EKind::kFull;
   std::uint8_t fOwner = 0x20, fLun = 0, fNumber = 0;  // of the controller that has the sensor
   std::uint8_t fType = 0, fReadingType = 0;
-  bool fIsPercentage = false;
-  std::uint8_t fUnit = 0;
+  TSensorUnit fUnit = {};
   TSensorScale fScale = {};
   TRawThresholds fThresholds = {};  // as the repository has them
   TFinding<std::string> fName = TMissing{};

@@ -13,7 +13,15 @@ namespace {
 
 constexpr std::uint16_t kUnknown = 0, kOther = 1, kOK = 2, kDegraded = 3, kStressed = 4, kError = 6;
 constexpr std::uint16_t kPercentage = 65;
-constexpr std::uint8_t kLastSharedUnit = 19;  // up to hertz, the schema has the units of IPMI in the same order
+
+// The units of IPMI that the schema has, in the same order within each range.
+constexpr struct TUnits {
+  std::uint8_t fFirst, fLast;
+  std::uint16_t fSchemaUnit;  // of the first
+  std::int8_t fExponent;      // power of ten: the schema has no milliseconds
+} kUnits[] = {{1, 19, 2, 0},    {20, 20, 21, -6}, {21, 21, 21, -3}, {22, 31, 21, 0}, {32, 32, 31, -3},
+              {33, 33, 31, -2}, {34, 50, 31, 0},  {51, 51, 47, -3}, {52, 52, 48, 0}, {53, 53, 48, -6},
+              {54, 58, 49, 0},  {60, 66, 54, 0},  {70, 70, 61, 0},  {74, 76, 62, 0}};
 
 std::uint16_t SchemaTypeOf(std::uint8_t sensorType) {
   constexpr std::uint8_t temperature = 1, voltage = 2, current = 3, fan = 4, intrusion = 5;
@@ -33,10 +41,26 @@ std::uint16_t SchemaTypeOf(std::uint8_t sensorType) {
   }
 }
 
-std::uint16_t SchemaUnitOf(TSdrSensor const& sensor) {
-  if (sensor.fIsPercentage) return kPercentage;
-  if (sensor.fUnit == 0) return kUnknown;
-  return sensor.fUnit <= kLastSharedUnit ? sensor.fUnit + 1 : kOther;
+struct TSchemaUnit {
+  std::uint16_t fUnit;
+  std::int32_t fExponent;
+};
+
+// The schema has no units that are made of two.
+TSchemaUnit SchemaUnitOf(TSensorUnit const& unit) {
+  if (unit.fIsPercentage) return {kPercentage, 0};
+  if (unit.fBase == 0) return {kUnknown, 0};
+  for (TUnits const& units : kUnits)
+    if (unit.fModifier == TSensorUnit::kNone && unit.fBase >= units.fFirst && unit.fBase <= units.fLast)
+      return {static_cast<std::uint16_t>(units.fSchemaUnit + unit.fBase - units.fFirst), units.fExponent};
+  return {kOther, 0};
+}
+
+// The schema has the rates of IPMI with the same numbers.
+TFinding<std::uint16_t> RateOf(TSensorUnit const& unit) {
+  constexpr std::uint8_t perDay = 6;
+  if (unit.fRate <= perDay) return std::uint16_t{unit.fRate};
+  return TMissing{kMissingUnexpected, "the sensor's record has the undefined rate " + std::to_string(unit.fRate)};
 }
 
 // The worst first.
@@ -86,7 +110,16 @@ bool HasThresholds(TSdrSensor const& sensor) { return sensor.fReadingType == kTh
 }  // namespace
 
 TSensorNumbers NumbersOf(TSdrSensor const& sensor) {
-  return {SchemaTypeOf(sensor.fType), SchemaUnitOf(sensor), sensor.fScale.IsWhole() ? 0 : -3};
+  auto const [unit, exponent] = SchemaUnitOf(sensor.fUnit);
+  return {SchemaTypeOf(sensor.fType), unit, exponent + (sensor.fScale.IsWhole() ? 0 : -3), RateOf(sensor.fUnit)};
+}
+
+TFinding<std::string> UnitDescriptionOf(TSdrSensor const& sensor) {
+  if (NumbersOf(sensor).fBaseUnits != kOther)
+    return TMissing{kMissingNotApplicable, "BaseUnits has the unit if the controller has one"};
+  std::string const text = UnitText(sensor.fUnit);
+  if (text.empty()) return TMissing{kMissingUnexpected, "the sensor's record has a unit that is not defined"};
+  return "unit: " + text;
 }
 
 TFinding<std::int32_t> ScaledValue(TSdrSensor const& sensor, std::uint8_t raw) {

@@ -10,8 +10,12 @@ namespace NQRVZEP20 {
 struct TSensorNumbers {
   std::uint16_t fSensorType, fBaseUnits;
   std::int32_t fUnitModifier;  // readings are in this power of ten of the unit
+  TFinding<std::uint16_t> fRateUnits;
 };
 TSensorNumbers NumbersOf(TSdrSensor const& sensor);
+
+// The name of a unit that the schema lacks: "unit: packets per s".
+TFinding<std::string> UnitDescriptionOf(TSdrSensor const& sensor);
 
 // A raw value in that power of ten of the unit.
 TFinding<std::int32_t> ScaledValue(TSdrSensor const& sensor, std::uint8_t raw);

@@ -47,9 +47,12 @@ TEST(EventWordsTest, AnEntryInAFormOfTheMakerIsShownInHexadecimal) {
 TEST(EventWordsTest, NumbersHaveNames) {
   EXPECT_EQ(SensorTypeName(kPowerSupply), "Power Supply");
   EXPECT_EQ(SensorTypeName(0xD0), "sensor type 0xd0");
-  EXPECT_EQ(UnitName(18), "RPM");
-  EXPECT_EQ(UnitName(0), "");
-  EXPECT_EQ(UnitName(0xFF), "");
+  EXPECT_EQ(UnitText({false, 18}), "RPM");
+  EXPECT_EQ(UnitText({false, 85, TSensorUnit::kNone, 0, 3}), "packets per s");
+  EXPECT_EQ(UnitText({false, 17, TSensorUnit::kMultiplied, 34}), "CFM * m");
+  EXPECT_EQ(UnitText({true}), "%");
+  EXPECT_EQ(UnitText({}), "");
+  EXPECT_EQ(UnitText({false, 0xFF}), "");
   EXPECT_EQ(StateName(kPowerSupply, kSpecific, 0), "Presence detected");
   EXPECT_EQ(StateName(kPowerSupply, 0x0B, 1), "Redundancy Lost");
 }

@@ -17,7 +17,7 @@ TEST(SdrRecordTest, AFullSensorHasScaleAndThresholds) {
   EXPECT_EQ(sensor->fType, 1);
   EXPECT_EQ(sensor->fReadingType, 1);
   EXPECT_EQ(*sensor->fName, "CPU Temp");
-  EXPECT_EQ(UnitName(sensor->fUnit), "degrees C");
+  EXPECT_EQ(UnitText(sensor->fUnit), "degrees C");
   EXPECT_EQ(*ValueOf(sensor->fScale, 45), 45);
   EXPECT_EQ(sensor->fThresholds.fValid, 0x38);
   EXPECT_EQ(sensor->fThresholds.fRaw[TRawThresholds::kUpperNonCritical], 80);

@@ -76,6 +76,15 @@ std::string WordOf(ICIMInstance const& instance, std::string const& property, TC
   return word.empty() ? value.ToString() : word;
 }
 
+// " Volts", " Bytes Per Second", " (unit: packets per s)".
+std::string UnitOf(TNamespaceView const& view, ICIMInstance const& sensor, TCIMValue const& unit) {
+  constexpr char const *other = "1", *none = "0";
+  auto const description = view.Answer(sensor, "Description"), rate = view.Answer(sensor, "RateUnits");
+  if (unit.ToString() == other && description.IsKnown()) return " (" + description.fValue->ToString() + ")";
+  bool const isRate = rate.IsKnown() && rate.fValue->ToString() != none;
+  return " " + WordOf(sensor, "BaseUnits", unit) + (isRate ? " " + WordOf(sensor, "RateUnits", *rate.fValue) : "");
+}
+
 // The reading in the unit of the sensor: "11.98 Volts".
 std::string ReadingText(TNamespaceView const& view, ICIMInstance const& sensor, TCIMValue const& reading) {
   auto const modifier = view.Answer(sensor, "UnitModifier"), unit = view.Answer(sensor, "BaseUnits");
@@ -83,7 +92,7 @@ std::string ReadingText(TNamespaceView const& view, ICIMInstance const& sensor, 
   char number[64];
   std::snprintf(number, sizeof number, "%.10g",
                 std::stod(reading.ToString()) * std::pow(10, std::stoi(modifier.fValue->ToString())));
-  return number + (" " + WordOf(sensor, "BaseUnits", *unit.fValue));
+  return number + UnitOf(view, sensor, *unit.fValue);
 }
 
 TCell CellOf(TNamespaceView const& view, ICIMInstance const& instance, char const* property) {
