@@ -12,6 +12,7 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr char const* kLogId = "ZEP:ipmi:sel";
+constexpr char const *kEntry = "IPMI Get SEL Entry", *kEntryAndSensor = "IPMI Get SEL Entry, sensor data records";
 
 template <class T>
 TFinding<T> Known(T value) {
@@ -175,9 +176,9 @@ TRecord NumericSensorRecord(TSensorState const& state, TComputerSystem const& sy
   record.SetSource("IPMI sensor data records");
   record.Add("BaseUnits", Known(numbers.fBaseUnits)).Names(kBaseUnitsNames);
   record.Add("UnitModifier", Known(numbers.fUnitModifier));
-  record.SetSource("IPMI Get Sensor Thresholds");
   record.Add("RateUnits", numbers.fRateUnits).Names(kRateUnitsNames);
   record.Add("Description", UnitDescriptionOf(state.fSensor));
+  record.SetSource("IPMI Get Sensor Thresholds");
   record.Add("LowerThresholdNonCritical", threshold(TRawThresholds::kLowerNonCritical));
   record.Add("UpperThresholdNonCritical", threshold(TRawThresholds::kUpperNonCritical));
   record.Add("LowerThresholdCritical", threshold(TRawThresholds::kLowerCritical));
@@ -221,17 +222,23 @@ TRecord LogRecord(TEventLog const& log) {
 
 TRecord EntryRecord(TLoggedEvent const& event) {
   std::string const label = EventLabelOf(event);
-  TRecord record("ZEP_EventLogEntry", "IPMI Get SEL Entry", "CIM_LogRecord");
+  TRecord record("ZEP_EventLogEntry", kEntry, "CIM_LogRecord");
   record.AddKey("LogCreationClassName", "ZEP_EventLog");
   record.AddKey("LogName", kLogId);
   record.AddKey("CreationClassName", "ZEP_EventLogEntry");
   record.AddKey("RecordID", std::to_string(event.fEntry.fId));
   record.AddKey("MessageTimestamp", TimeOf(event.fEntry));
+  record.SetSource(kEntryAndSensor);
   record.Add("ElementName", Known(label));
+  record.SetSource(kEntry);
   record.Add("PerceivedSeverity", Known(static_cast<std::uint16_t>(SeverityOf(event.fEntry)))).Names(kPerceivedSeverityNames);
+  record.SetSource(kEntryAndSensor);
   record.Add("RecordData", Known(label + ": " + EventText(event.fEntry, event.fSensor)));
+  record.SetSource(kEntry);
   record.Add("SensorTypeName", SensorTypeNameOf(event.fEntry));
+  record.SetSource("IPMI Get SEL Entry, Get SEL Time");
   record.Add("Age", event.fAge).Unit("second");
+  record.SetSource("IPMI Get SEL Entry, Get Sensor Reading");
   record.Add("HasEnded", Known(event.fHasEnded));
   return record;
 }

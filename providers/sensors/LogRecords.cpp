@@ -57,11 +57,14 @@ TRecord KernelEventRecord(TKernelEvent const& event, TRunningClock const& clock)
   record.AddKey("LogName", kLogName);
   record.AddKey("CreationClassName", record.GetClassName());
   record.AddKey("RecordID", std::to_string(event.fMessage.fNumber));
+  record.SetSource("/dev/kmsg, /proc/stat");
   record.AddKey("MessageTimestamp", TFinding<TCIMDateTime>(TimeOf(event.fMessage, clock)));
+  record.SetSource(kSource);
   record.Add("RecordData", TFinding<std::string>(event.fMessage.fText));
   record.Add("PerceivedSeverity", TFinding<std::uint16_t>(event.fSeverity)).Names(kPerceivedSeverityNames);
   record.Add("Kind", TFinding<std::uint16_t>(event.fKind)).Names(kKindNames);
   record.Add("Subject", SubjectOf(event));
+  record.SetSource("/dev/kmsg, /proc/uptime");
   record.Add("Age", AgeOf(event.fMessage, clock)).Unit("second");
   return record;
 }

@@ -2,11 +2,14 @@
 #include "providers/controller/ControllerNamespace.h"
 
 #include "providers/controller/Connections.h"
+#include "providers/controller/ControllerRecords.h"
 #include "tests/Support.h"
 #include "tests/providers/NamespaceText.h"
 #include "tests/providers/controller/FakeController.h"
 
 #include <gmock/gmock.h>
+
+#include <map>
 
 namespace NQRVZEP20 {
 namespace {
@@ -95,6 +98,15 @@ TEST_F(ControllerNamespaceTest, EveryPartHasItsInstances) {
     EXPECT_THAT(text, HasSubstr(std::string("  ") + line + "\n"));
   EXPECT_THAT(text, HasSubstr("00000000010000.000000:000")) << "before the clock was set, times are intervals";
   EXPECT_THAT(text, Not(HasSubstr("ElementName: again"))) << "the second record of one sensor";
+}
+
+TEST_F(ControllerNamespaceTest, AnEntryNamesAllItsSources) {
+  std::map<std::string, std::string> sources;
+  TRecord const record = EntryRecord({});
+  for (TRecordProperty const& property : record.GetProperties()) sources[property.fName] = property.fSource;
+  EXPECT_EQ(sources["Age"], "IPMI Get SEL Entry, Get SEL Time");
+  EXPECT_EQ(sources["HasEnded"], "IPMI Get SEL Entry, Get Sensor Reading");
+  EXPECT_EQ(sources["RecordData"], "IPMI Get SEL Entry, sensor data records");
 }
 
 TEST_F(ControllerNamespaceTest, AnEntryInAFormOfTheMakerDoesNotEndAState) {

@@ -2,12 +2,14 @@
 #include "providers/sensors/SensorsNamespace.h"
 
 #include "providers/reasons/TMachineFiles.h"
+#include "providers/sensors/LogRecords.h"
 #include "tests/Support.h"
 #include "tests/providers/NamespaceText.h"
 
 #include <gmock/gmock.h>
 
 #include <filesystem>
+#include <map>
 
 namespace NQRVZEP20 {
 namespace {
@@ -64,6 +66,15 @@ TEST_F(SensorsNamespaceTest, ErrorsInTheLogBelongToTheLogOfTheSystem) {
   EXPECT_THAT(text, HasSubstr("GoneRecords: 7"));
   EXPECT_THAT(text, HasSubstr("CIM_LogManagesRecord"));
   EXPECT_THAT(text, HasSubstr("CIM_UseOfLog"));
+}
+
+TEST_F(SensorsNamespaceTest, TheTimesOfARecordNameAllTheirSources) {
+  std::map<std::string, std::string> sources;
+  TRecord const record = KernelEventRecord({}, {});
+  for (TRecordProperty const& property : record.GetProperties()) sources[property.fName] = property.fSource;
+  EXPECT_EQ(sources["MessageTimestamp"], "/dev/kmsg, /proc/stat");
+  EXPECT_EQ(sources["Age"], "/dev/kmsg, /proc/uptime");
+  EXPECT_EQ(sources["RecordData"], "/dev/kmsg");
 }
 
 TEST_F(SensorsNamespaceTest, ALogWithoutErrorsHasAReasonForNoRecords) {
