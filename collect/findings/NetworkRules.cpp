@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/findings/Rules.h"
 
+#include <algorithm>
+#include <cstdlib>
 #include <set>
 
 namespace NQRVZEP20 {
@@ -59,17 +61,38 @@ void AskHalfDuplex(TRuleRun& run) {
   }
 }
 
-// Many fast ports are connected to slower switches on purpose, but not at 100 Mbit/s: a broken pair of a cable causes that.
+constexpr std::uint64_t kMegabit = 1000000;
+
+// "1000baseT/Full" begins with the speed in Mbit/s.
+std::uint64_t SpeedOfMode(std::string const& mode) { return std::strtoull(mode.c_str(), nullptr, 10) * kMegabit; }
+
+// The highest speed that both ends of the port advertise; 0 if that of one end is unknown.
+std::uint64_t HighestCommonSpeed(TRuleRun const& run, std::string const& port) {
+  std::uint64_t highest = 0;
+  for (TElement const& capabilities : run.TryElements("ZEP_EthernetPortCapabilities")) {
+    auto const own = capabilities.Texts("AdvertisedLinkModes"), partners = capabilities.Texts("PartnerLinkModes");
+    if (capabilities.Label() != port || !own.IsKnown() || !partners.IsKnown()) continue;
+    for (std::string const& mode : *own.fValue)
+      if (Has(*partners.fValue, mode)) highest = std::max(highest, SpeedOfMode(mode));
+  }
+  return highest;
+}
+
+// Many fast ports are connected to slower switches on purpose. Two ends that advertise more than they use have a bad cable. If
+// the modes of the other end are unknown, a port at 100 Mbit/s is judged: a broken pair of a cable causes that.
 void AskSlowPort(TRuleRun& run) {
-  constexpr std::uint64_t fast = 100000000, gigabit = 1000000000;
+  constexpr std::uint64_t fast = 100 * kMegabit, gigabit = 1000 * kMegabit;
   for (TElement const& port : run.Elements("CIM_EthernetPort")) {
     if (!IsUp(port)) continue;
     auto const speed = port.Number("Speed"), highest = port.Number("MaxSpeed");
     if (!run.Know(port, speed) || !run.Know(port, highest)) continue;
-    if (*speed.fValue <= fast && *highest.fValue >= gigabit)
+    std::uint64_t const common = HighestCommonSpeed(run, port.Label());
+    bool const isSlow = common > 0 ? *speed.fValue < common : *speed.fValue <= fast && *highest.fValue >= gigabit;
+    if (isSlow)
       run.Add(port, speed.fSource, ESeverity::kWarning,
-              "the network port " + port.Label() + " runs at " + std::to_string(*speed.fValue / 1000000) +
-                  " Mbit/s, although it can run at " + std::to_string(*highest.fValue / 1000000),
+              "the network port " + port.Label() + " runs at " + std::to_string(*speed.fValue / kMegabit) + " Mbit/s, although " +
+                  (common > 0 ? "both ends advertise " : "it can run at ") +
+                  std::to_string((common > 0 ? common : *highest.fValue) / kMegabit),
               kCheckCable);
   }
 }
@@ -150,7 +173,7 @@ void AskBond(TRuleRun& run) {
 std::vector<TRule> NetworkRules() {
   return {{"port-errors", "Does a network interface count errors?", AskPortErrors},
           {"port-half-duplex", "Does a network port use half duplex?", AskHalfDuplex},
-          {"port-slow", "Is a network port far below its speed?", AskSlowPort},
+          {"port-slow", "Is a network port below its speed?", AskSlowPort},
           {"port-unplugged", "Does a network port that is in use have no link?", AskUnpluggedPort},
           {"bond-member", "Does a bond lack a member?", AskBond}};
 }

@@ -34,6 +34,7 @@ inline constexpr char const* kRuleClasses = R"(
   class ZEP_Mount { [key] string InstanceID; string ElementName; string Type; string Options; string FileSystemOptions; };
   class ZEP_InterfaceStatistics { [key] string InstanceID; string ElementName; uint64 ReceiveErrors; uint64 TransmitErrors;
     uint64 PacketsReceived; uint64 PacketsTransmitted; };
+  class ZEP_EthernetPortCapabilities { [key] string ElementName; string AdvertisedLinkModes[]; string PartnerLinkModes[]; };
   class CIM_EthernetPort { [key] string DeviceID; uint16 EnabledState; uint16 OperationalStatus[]; boolean FullDuplex;
     uint64 Speed; uint64 MaxSpeed; };
   class CIM_IPProtocolEndpoint { [key] string Name; string InterfaceName; uint16 AddressOrigin; };

@@ -148,6 +148,23 @@ TEST(RulesTest, APortWithHalfDuplexOrFarBelowItsSpeedIsNamed) {
   EXPECT_EQ(Outcome("port-slow", Port(up)), "not-asked");
 }
 
+TEST(RulesTest, APortIsComparedWithTheModesOfBothEnds) {
+  auto const at = [](char const* mbits, char const* own, char const* partners) {
+    return Port(std::string("OperationalStatus = {2}; MaxSpeed = 10000000000; Speed = ") + mbits + "000000;") +
+           "instance of ZEP_EthernetPortCapabilities { ElementName = \"eth0\"; AdvertisedLinkModes = " + own +
+           "; PartnerLinkModes = " + partners + "; };";
+  };
+  std::string const rule = "port-slow";
+  char const *all = R"({"100baseT/Full", "1000baseT/Full", "10000baseT/Full"})", *upTo100 = R"({"100baseT/Full"})";
+  EXPECT_THAT(Problems(rule, at("1000", all, all)),
+              ElementsAre("warning: the network port eth0 runs at 1000 Mbit/s, although both ends advertise 10000"));
+  EXPECT_THAT(Problems(rule, at("10000", all, all)), IsEmpty());
+  EXPECT_THAT(Problems(rule, at("100", all, upTo100)), IsEmpty()) << "the partner has no other speed";
+  EXPECT_THAT(Problems(rule, at("100", upTo100, all)), IsEmpty()) << "limited on purpose";
+  EXPECT_THAT(Problems(rule, at("100", all, "{}")), testing::SizeIs(1)) << "the modes of the partner are unknown";
+  EXPECT_THAT(Problems(rule, at("1000", all, "{}")), IsEmpty());
+}
+
 TEST(RulesTest, AnUnpluggedPortIsNamedOnlyIfItIsInUse) {
   std::string const unplugged = Port("EnabledState = 6; OperationalStatus = {12};");
   auto const address = [](int origin) {
