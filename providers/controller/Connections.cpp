@@ -7,6 +7,7 @@
 #include <future>
 #include <memory>
 #include <optional>
+#include <system_error>
 #include <thread>
 #include <utility>
 
@@ -59,7 +60,11 @@ TIpmi InThreads(TIpmi ipmi, TClock::duration limit) {
   return [ipmi = std::move(ipmi), end = TClock::now() + limit](TIpmiRequest const& request) -> TFinding<std::string> {
     std::packaged_task<TFinding<std::string>()> task([ipmi, request] { return ipmi(request); });
     auto answer = task.get_future();
-    std::thread(std::move(task)).detach();
+    try {
+      std::thread(std::move(task)).detach();
+    } catch (std::system_error const& failure) {
+      return TMissing{kMissingUnreadable, "no thread can be started for the controller's commands: " + failure.code().message()};
+    }
     if (answer.wait_until(end) != std::future_status::ready) return TimeIsUp();
     return answer.get();
   };

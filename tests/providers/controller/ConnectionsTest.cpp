@@ -5,6 +5,7 @@
 #include "tests/providers/controller/FakeController.h"
 
 #include <gtest/gtest.h>
+#include <pthread.h>
 
 #include <filesystem>
 
@@ -29,6 +30,23 @@ TEST(WithinTimeTest, NoCommandIsSentAfterOneWithoutAnAnswer) {
   TIpmi const limited = WithinTime(silent, std::chrono::hours(1));
   for (int i = 0; i < 3; ++i) EXPECT_EQ(limited({6, 1}).Why().fReason, "silence");
   EXPECT_EQ(sent, 1);
+}
+
+// A stack that no address space has room for.
+TEST(InThreadsTest, ACommandThatNoThreadCanSendHasAReason) {
+  pthread_attr_t attributes;
+  ASSERT_EQ(::pthread_getattr_default_np(&attributes), 0);
+  std::size_t usual = 0;
+  ::pthread_attr_getstacksize(&attributes, &usual);
+  ::pthread_attr_setstacksize(&attributes, std::size_t{1} << 47);
+  ASSERT_EQ(::pthread_setattr_default_np(&attributes), 0);
+  TIpmi const ipmi = [](TIpmiRequest const&) -> TFinding<std::string> { return Bytes({0}); };
+  auto const answer = InThreads(ipmi, std::chrono::hours(1))({6, 1});
+  ::pthread_attr_setstacksize(&attributes, usual);
+  ::pthread_setattr_default_np(&attributes);
+  ::pthread_attr_destroy(&attributes);
+  ASSERT_FALSE(answer);
+  EXPECT_EQ(answer.Why().fReason, "no thread can be started for the controller's commands: Resource temporarily unavailable");
 }
 
 TEST(RecordedTest, AnswersAreRecordedAndReadAgain) {
