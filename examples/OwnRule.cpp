@@ -20,7 +20,8 @@ void AskMemory(TRuleRun& run) {
     auto const capacity = module.Number("Capacity");
     if (run.Know(module, capacity)) bytes += *capacity.fValue;  // notes the reason if the value is missing
   }
-  if (!modules.empty() && run.GetNotAsked().empty() && bytes < least * gibibyte)
+  if (modules.empty() && run.GetNotAsked().empty()) run.NoteNotAsked({"the firmware describes no memory modules", ""});
+  if (run.GetNotAsked().empty() && bytes < least * gibibyte)
     run.Add(modules.front(), modules.front().Number("Capacity").fSource, ESeverity::kWarning,
             "the memory of " + std::to_string(bytes / gibibyte) + " GiB is smaller than " + std::to_string(least) + " GiB",
             "Add memory modules.");

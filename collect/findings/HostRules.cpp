@@ -53,10 +53,13 @@ std::string ChannelOf(TElement const& module) {
 void AskDifferentModules(TRuleRun& run) {
   std::map<std::string, std::vector<TElement>> channels;
   auto const modules = run.Elements("CIM_PhysicalMemory");
-  for (TElement const& module : modules)
-    if (std::string const channel = ChannelOf(module); !channel.empty() && run.Know(module, module.Number("Capacity")))
-      channels[channel].push_back(module);
-  if (channels.empty() && modules.size() > 1) run.NoteNotAsked({"the firmware does not name the channels of the modules", ""});
+  bool hasNames = false;
+  for (TElement const& module : modules) {
+    std::string const channel = ChannelOf(module);
+    hasNames = hasNames || !channel.empty();
+    if (!channel.empty() && run.Know(module, module.Number("Capacity"))) channels[channel].push_back(module);
+  }
+  if (!hasNames && modules.size() > 1) run.NoteNotAsked({"the firmware does not name the channels of the modules", ""});
   for (auto const& [channel, members] : channels) {
     std::string const difference = DifferenceIn(members, {"Capacity", "MemoryType", "MaxMemorySpeed"});
     if (!difference.empty())

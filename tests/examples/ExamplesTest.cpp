@@ -13,6 +13,7 @@
 
 #include <cstdio>
 #include <filesystem>
+#include <functional>
 #include <map>
 #include <memory>
 #include <regex>
@@ -21,6 +22,8 @@
 
 namespace NQRVZEP20 {
 namespace {
+
+using namespace std::string_literals;
 
 TCIMContext const kNone;
 
@@ -125,6 +128,20 @@ TEST(PrintReportTest, PrintsTheIdentityAndTheMemoryOfTheSample) {
   EXPECT_THAT(PrintedReport(), testing::MatchesRegex("Host name: db1\n(.*\n)*OS: (.*\n)*Memory: 128 GiB\n0\n"));
 }
 
+// The sample's SMBIOS table after `change` of each memory module.
+std::string SampleWithModules(std::function<std::string(std::string const& module)> const& change) {
+  std::string const table = SourceFile("tools/zep/sample/smbios.bin");
+  constexpr char memoryModule = 17;
+  std::string changed;
+  for (std::size_t start = 0; start < table.size();) {
+    std::size_t const strings = start + static_cast<std::uint8_t>(table[start + 1]), end = table.find("\0\0"s, strings) + 2;
+    std::string const structure = table.substr(start, end - start);
+    changed += structure[0] == memoryModule ? change(structure) : structure;
+    start = end;
+  }
+  return changed;
+}
+
 // The answer of the example's rule about a machine with that SMBIOS table.
 std::string AnswerOfOwnRule(std::string const& table) {
   TEnvironmentGuard const variable("ZEP_SMBIOS_TABLE", table.c_str());
@@ -136,6 +153,10 @@ TEST(OwnRuleTest, FindsTheProblemOrNothingOrTheReason) {
   EXPECT_EQ(AnswerOfOwnRule(SourcePath("tools/zep/sample/smbios.bin")), "site-memory: fine\n");
   WriteFile(dir.Path("empty"), "");
   EXPECT_EQ(AnswerOfOwnRule(dir.Path("empty")), "site-memory: not-asked\n");
+  WriteFile(dir.Path("none"), SampleWithModules([](std::string const&) { return std::string(); }));
+  EXPECT_EQ(AnswerOfOwnRule(dir.Path("none")), "site-memory: not-asked\n") << "a table without modules";
+  WriteFile(dir.Path("small"), SampleWithModules([](std::string module) { return module.replace(0x0C, 2, "\0\x04"s); }));
+  EXPECT_EQ(AnswerOfOwnRule(dir.Path("small")), "warning: the memory of 8 GiB is smaller than 64 GiB\nsite-memory: wrong\n");
 }
 
 TEST(ListProviderTest, EndsInTheStatusOfAPlugInThatDoesNotLoad) {

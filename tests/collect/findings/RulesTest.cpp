@@ -344,6 +344,18 @@ TEST(RulesTest, ModulesAreComparedWithinTheirChannel) {
   EXPECT_EQ(Outcome("memory-differs", Module("0", "BANK 0", "8") + Module("1", "BANK 0", "16")), "not-asked");
 }
 
+TEST(RulesTest, AModuleOfAChannelWithoutACapacityIsNotExamined) {
+  std::string const modules = Module("0", "P0 CHANNEL A", "8") + Module("1", "P0 CHANNEL A", "NULL");
+  auto const missing = Missing("CIM_PhysicalMemory.Tag=\\\"1\\\"", "Capacity", "not-given");
+  auto const notAsked = ResultOf("memory-differs", FindingsOf(modules + missing)).fNotAsked;
+  ASSERT_EQ(notAsked.size(), 1U);
+  EXPECT_EQ(notAsked[0].fReason, "a reason");
+  auto const alone =
+      ResultOf("memory-differs", FindingsOf(Module("1", "P0 CHANNEL A", "NULL") + missing + Module("2", "P0 CHANNEL A", "NULL")))
+          .fNotAsked;
+  for (TNotAsked const& reason : alone) EXPECT_NE(reason.fReason, "the firmware does not name the channels of the modules");
+}
+
 TEST(RulesTest, WeaknessesWithoutMitigationAreListed) {
   std::string const weaknesses = R"(instance of ZEP_ProcessorWeakness { Name = "mds"; State = 4; };
                                     instance of ZEP_ProcessorWeakness { Name = "retbleed"; State = 4; };
