@@ -289,6 +289,19 @@ TEST_F(RecordedFaultsTest, OfTheManagementController) {
   ExpectFoundAndGone(rows);
 }
 
+// The tables of this file have a row for each rule; problems of plug-ins have a test of their own.
+TEST_F(RecordedFaultsTest, OfEveryRule) {
+  std::string const tables = ReadFile(SourcePath("tests/system/machines/RecordedFaultsTest.cpp"));
+  nlohmann::json const rules = Findings()["rules"];
+  EXPECT_FALSE(rules.empty());
+  for (nlohmann::json const& rule : rules) {
+    std::string const id = rule["id"];
+    if (id != "plug-in") {
+      EXPECT_THAT(tables, testing::ContainsRegex("\\{\"(critical|error|warning|information) " + id + "\",")) << id;
+    }
+  }
+}
+
 // A plug-in reports problems only, so that the rule has nothing to examine without one.
 TEST_F(RecordedFaultsTest, OfAPlugIn) {
   Write("batteries/BAT0/capacity", "97\n");
