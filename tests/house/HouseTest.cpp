@@ -130,6 +130,7 @@ TTestWithoutSource const kTestsWithoutSource[] = {
     {"tools/zep/commands/ArgumentsTest.cpp", "every command of zep: its arguments"},
     {"tools/zep/commands/EnvelopeTest.cpp", "every command of zep: its exit status and document"},
     {"tools/zep/commands/ProvidersAtWorkTest.cpp", "commands/Providers: limits, interrupts and progress of plug-ins"},
+    {"tools/zep/commands/RedactedSecretsTest.cpp", "commands/Redacting: what is left in the reports of recorded machines"},
 };
 
 char const* ReasonForNoSource(fs::path const& test) {
