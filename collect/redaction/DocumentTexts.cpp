@@ -24,7 +24,7 @@ bool IsName(std::string_view member, TJson const& value, TPlace const& place) {
   return (value.is_string() || value.is_array()) && std::binary_search(std::begin(kNames), std::end(kNames), member);
 }
 
-bool IsIdentifierByte(char byte) { return byte == '_' || (IsWordByte(byte) && static_cast<unsigned char>(byte) < 0x80); }
+bool IsIdentifierByte(char byte) { return byte == '_' || IsLetterOrDigit(byte); }
 
 // Whether the object is a property whose value is a number or a time, perhaps as a text.
 bool IsNumber(TJson const& object) {

@@ -111,7 +111,7 @@ std::string Base64(std::string_view value, std::size_t skipped) {
 
 std::string PercentEncoded(std::string_view value) {
   std::string text;
-  for (char const byte : value) text += IsWordByte(byte) && byte > 0 ? std::string(1, byte) : "%" + HexOf({&byte, 1});
+  for (char const byte : value) text += IsLetterOrDigit(byte) ? std::string(1, byte) : "%" + HexOf({&byte, 1});
   return text;
 }
 

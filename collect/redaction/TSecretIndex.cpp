@@ -58,7 +58,7 @@ void TSecretIndex::Add(ESecretKind kind, std::string const& value) {
 
 void TSecretIndex::AddSpelling(TSpelling spelling) {
   std::string const& text = spelling.fText;
-  while (spelling.fPrefix < text.size() && !IsWordByte(text[spelling.fPrefix])) ++spelling.fPrefix;
+  while (spelling.fPrefix < text.size() && SizeOfWordCharacter(text, spelling.fPrefix) == 0) ++spelling.fPrefix;
   std::string const word = Lower(text.substr(spelling.fPrefix, EndOfWord(text, spelling.fPrefix) - spelling.fPrefix));
   if (word.empty()) return;
   fWords.set(HashOf(word, word.size()));

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/redaction/Texts.h"
 
+#include "collect/SafeText.h"
+
 #include <arpa/inet.h>
 
 #include <algorithm>
@@ -8,6 +10,25 @@
 namespace NQRVZEP20 {
 
 namespace {
+
+// Blocks of Unicode without letters: spaces, quotes, punctuation, arrows, symbols, and the byte order mark.
+bool IsMark(std::uint32_t code) {
+  constexpr std::uint32_t blocks[][2] = {{0x80, 0xbf},     {0xd7, 0xd7},     {0xf7, 0xf7},     {0x2000, 0x206f},
+                                         {0x2190, 0x2bff}, {0x2e00, 0x2e7f}, {0x3000, 0x3003}, {0x3008, 0x3020},
+                                         {0xfe30, 0xfe6f}, {0xfeff, 0xff0f}};
+  return std::any_of(std::begin(blocks), std::end(blocks),
+                     [&](auto const& block) { return code >= block[0] && code <= block[1]; });
+}
+
+// Whether the character that ends at `end` belongs to a word.
+bool IsWordBefore(std::string_view text, std::size_t end) {
+  constexpr std::size_t longest = 4;
+  if (end == 0) return false;
+  if (static_cast<unsigned char>(text[end - 1]) < 0x80) return IsLetterOrDigit(text[end - 1]);
+  for (std::size_t size = 2; size <= std::min(longest, end); ++size)
+    if (SizeOfWordCharacter(text.substr(0, end), end - size) == size) return true;
+  return false;
+}
 
 bool IsAddress(int family, std::string_view text) {
   in6_addr address;
@@ -41,6 +62,19 @@ void AddParts(std::string_view text, std::size_t begin, std::size_t end, bool wi
   }
 }
 
+// The end of the name of an account that begins at `at`.
+std::size_t EndOfName(std::string_view text, std::size_t at) {
+  constexpr std::string_view marks = "._-@+$\\";
+  std::size_t const begin = at;
+  while (at < text.size()) {
+    std::size_t const size = SizeOfWordCharacter(text, at);
+    if (size == 0 && marks.find(text[at]) == marks.npos) break;
+    at += std::max<std::size_t>(size, 1);
+  }
+  while (at > begin && text[at - 1] == '.') --at;  // the end of a sentence
+  return at;
+}
+
 }  // namespace
 
 std::string Lower(std::string_view text) {
@@ -51,19 +85,30 @@ std::string Lower(std::string_view text) {
 
 bool IsHex(std::string_view text) { return !text.empty() && text.find_first_not_of("0123456789abcdefABCDEF") == text.npos; }
 
+std::size_t SizeOfWordCharacter(std::string_view text, std::size_t at) {
+  if (at >= text.size()) return 0;
+  if (static_cast<unsigned char>(text[at]) < 0x80) return IsLetterOrDigit(text[at]) ? 1 : 0;
+  TCharacter const character = FirstCharacterOf(text.substr(at));
+  return character.fSize == 0 || IsMark(character.fCode) ? 0 : character.fSize;
+}
+
 std::string Compact(std::string_view text) {
   std::string compact;
-  std::copy_if(text.begin(), text.end(), std::back_inserter(compact), IsWordByte);
+  for (std::size_t at = 0; at < text.size();) {
+    std::size_t const end = EndOfWord(text, at);
+    compact += text.substr(at, end - at);
+    at = end + 1;
+  }
   return compact;
 }
 
 std::size_t EndOfWord(std::string_view text, std::size_t at) {
-  while (at < text.size() && IsWordByte(text[at])) ++at;
+  while (std::size_t const size = SizeOfWordCharacter(text, at)) at += size;
   return at;
 }
 
 bool IsWordBound(std::string_view text, std::size_t begin, std::size_t end) {
-  return (begin == 0 || !IsWordByte(text[begin - 1])) && (end == text.size() || !IsWordByte(text[end]));
+  return !IsWordBefore(text, begin) && SizeOfWordCharacter(text, end) == 0;
 }
 
 bool IsIPv4(std::string_view text) { return IsAddress(AF_INET, text); }
@@ -117,7 +162,7 @@ std::vector<std::string> HomesIn(std::string_view text) {
   std::vector<std::string> names;
   for (std::size_t at = 0; (at = text.find(home, at)) != text.npos;) {
     at += home.size();
-    std::size_t const end = std::min(text.find_first_of("/ :\"',;)", at), text.size());
+    std::size_t const end = EndOfName(text, at);
     if (end > at) names.emplace_back(text.substr(at, end - at));
   }
   return names;

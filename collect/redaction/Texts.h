@@ -9,12 +9,15 @@
 
 namespace NQRVZEP20 {
 
-// Words of texts. A word is a run of ASCII letters, digits, and bytes of other UTF-8 characters.
+// Words of texts in UTF-8. A word is a run of letters, digits and other characters, except ASCII marks, and except spaces,
+// quotes, punctuation and symbols of Unicode. Bytes that are not UTF-8 belong to no word.
 
-inline bool IsWordByte(char byte) {
-  return (byte >= '0' && byte <= '9') || (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z') ||
-         static_cast<unsigned char>(byte) >= 0x80;
+inline bool IsLetterOrDigit(char byte) {
+  return (byte >= '0' && byte <= '9') || (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z');
 }
+
+// The size of the character of a word at `at`; 0 if there is none.
+std::size_t SizeOfWordCharacter(std::string_view text, std::size_t at);
 
 inline char Lower(char byte) { return byte >= 'A' && byte <= 'Z' ? static_cast<char>(byte - 'A' + 'a') : byte; }
 std::string Lower(std::string_view text);
@@ -22,13 +25,13 @@ std::string Lower(std::string_view text);
 // Whether it consists of hexadecimal digits; an empty text does not.
 bool IsHex(std::string_view text);
 
-// The bytes of words alone: "525400112201" for "52:54:00:11:22:01".
+// The words alone: "525400112201" for "52:54:00:11:22:01".
 std::string Compact(std::string_view text);
 
 // The end of the word that begins at `at`, or `at` if none does.
 std::size_t EndOfWord(std::string_view text, std::size_t at);
 
-// Whether no word continues across this place: at the begin, at the end, and at a byte that belongs to no word.
+// Whether no word continues across the two places: each is an end of the text, or beside a byte that belongs to no word.
 bool IsWordBound(std::string_view text, std::size_t begin, std::size_t end);
 
 // Whether the text is an IPv4 or IPv6 address, or a MAC address with colons or hyphens.

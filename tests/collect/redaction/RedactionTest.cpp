@@ -129,6 +129,24 @@ TEST(RedactionTest, AUserIsFoundByTheHomeDirectory) {
   EXPECT_THAT(Redacted(document), testing::HasSubstr("/home/user-1/zep/lib"));
 }
 
+TEST(RedactionTest, ASecretBesideSpacesAndQuotesOfUnicodeIsFound) {
+  TJson document = DocumentWith("SerialNumber", "ZX81-77");
+  document["head"] = {"\xe2\x80\x9cZX81-77\xe2\x80\x9d",
+                      "a\xc2\xa0ZX81-77\xc2\xa0"
+                      "b",
+                      "\xc2\xabZX81-77\xc2\xbb",
+                      "\xe3\x80\x8cZX81-77\xe3\x80\x8d",
+                      "ZX81-77\xe2\x80\x93ZX81-77",
+                      "\xe2\x80\x9c/home/carol\xe2\x80\x9d"};
+  TJson redacted = document;
+  TPseudonyms pseudonyms("1");
+  Redact(redacted, AllKinds(), pseudonyms);
+  for (char const* secret : {"ZX81", "carol"}) EXPECT_THAT(redacted.dump(), testing::Not(testing::HasSubstr(secret)));
+  EXPECT_EQ(redacted["head"][0], "\xe2\x80\x9cserial-1\xe2\x80\x9d");
+  Unredact(redacted, pseudonyms);
+  EXPECT_EQ(redacted, document);
+}
+
 TEST(RedactionTest, NamesOfClassesAndNamespacesRemain) {
   std::string const text = Redacted(DocumentWith("SystemName", "root"));
   EXPECT_THAT(text, testing::HasSubstr("\"namespace\":\"root/x\""));

@@ -22,6 +22,43 @@ TEST(TextsTest, FindsAddressesAsWholeTokens) {
 
 TEST(TextsTest, FindsTheNamesOfHomeDirectories) {
   EXPECT_THAT(HomesIn("/home/alice/bin:/home/bob,/home/ and /home"), ElementsAre("alice", "bob"));
+  EXPECT_THAT(HomesIn("\xe2\x80\x9c/home/j\xc3\xb6rg\xe2\x80\x9d and /home/a.b-c_d."), ElementsAre("j\xc3\xb6rg", "a.b-c_d"));
+}
+
+TEST(TextsTest, LettersOfAnyLanguageContinueAWordAndOtherCharactersEndIt) {
+  struct TRow {
+    char const* fWhat;
+    std::string fCharacter;
+    bool fContinues;
+  };
+  TRow const rows[] = {
+      {"umlaut", "\xc3\xa4", true},
+      {"Cyrillic", "\xd0\xb6", true},
+      {"Chinese", "\xe4\xb8\xad", true},
+      {"beyond 16 bits", "\xf0\x90\x90\xb7", true},
+      {"no-break space", "\xc2\xa0", false},
+      {"angle quote", "\xc2\xab", false},
+      {"multiplication sign", "\xc3\x97", false},
+      {"thin space", "\xe2\x80\x89", false},
+      {"quotation mark", "\xe2\x80\x9c", false},
+      {"dash", "\xe2\x80\x93", false},
+      {"arrow", "\xe2\x86\x92", false},
+      {"ideographic space", "\xe3\x80\x80", false},
+      {"corner bracket", "\xe3\x80\x8c", false},
+      {"byte order mark", "\xef\xbb\xbf", false},
+      {"fullwidth comma", "\xef\xbc\x8c", false},
+      {"a byte that is not UTF-8", "\xff", false},
+      {"part of a character", "\xe4\xb8", false},
+      {"the rest of a character", "\x80", false},
+  };
+  for (TRow const& row : rows) {
+    std::string const text = row.fCharacter + "ab" + row.fCharacter;
+    EXPECT_EQ(SizeOfWordCharacter(text, 0), row.fContinues ? row.fCharacter.size() : 0) << row.fWhat;
+    EXPECT_EQ(EndOfWord(text, row.fCharacter.size()), row.fContinues ? text.size() : row.fCharacter.size() + 2) << row.fWhat;
+    EXPECT_NE(IsWordBound(text, row.fCharacter.size(), text.size()), row.fContinues) << row.fWhat;
+    EXPECT_NE(IsWordBound(text, 0, row.fCharacter.size() + 2), row.fContinues) << row.fWhat;
+    EXPECT_EQ(Compact(text), row.fContinues ? text : "ab") << row.fWhat;
+  }
 }
 
 TEST(SpellingsTest, AValueHasASpellingInEachEncoding) {
