@@ -13,6 +13,9 @@ extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size
   TSdrRecord const record = SdrRecordFrom({reinterpret_cast<char const*>(data), size});
   Require(!record.fSensor || !record.fFru);
   if (!record.fSensor) return 0;
+  auto const sharers = SharersOf(*record.fSensor);
+  Require(sharers.size() <= 15);
+  for (std::size_t i = 0; i < sharers.size(); ++i) Require(sharers[i].fNumber == record.fSensor->fNumber + i);
   for (unsigned raw = 0; raw < 256; ++raw) {
     auto const value = ValueOf(record.fSensor->fScale, static_cast<std::uint8_t>(raw));
     Require(value ? std::isfinite(*value) : !value.Why().fReason.empty());

@@ -3,6 +3,7 @@
 
 #include "TBytes.h"
 
+#include <algorithm>
 #include <set>
 
 namespace NQRVZEP20 {
@@ -43,7 +44,7 @@ void ReadEntries(TEventLog& log, TIpmi const& ipmi, TProgress const& progress) {
       return;
     }
     log.fEntries.push_back(*SelEntryFrom(std::string_view(*answer).substr(2)));
-    progress("event log entries", log.fEntries.size(), log.fCount);
+    progress("event log entries", log.fEntries.size(), std::max<std::size_t>(log.fEntries.size(), log.fCount));
     id = TBytes(*answer).Word(0);
   } while (id != kNoMoreEntries && seen.insert(id).second && log.fEntries.size() < kMostEntries);
   if (id != kNoMoreEntries) log.fIsComplete = TMissing{kMissingUnexpected, "the event log has no end"};

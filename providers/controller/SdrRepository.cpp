@@ -123,7 +123,7 @@ TSdrRepository ReadRecords(TIpmi const& ipmi, std::size_t count, TProgress const
       return repository;
     }
     repository.fRecords.push_back(*record);
-    progress("sensor data records", repository.fRecords.size(), count);
+    progress("sensor data records", repository.fRecords.size(), std::max(repository.fRecords.size(), count));
     id = next;
   } while (id != kNoMoreRecords && seen.insert(id).second && repository.fRecords.size() < kMostRecords);
   if (id != kNoMoreRecords) repository.fIsComplete = TMissing{kMissingUnexpected, "the list of sensor data records has no end"};

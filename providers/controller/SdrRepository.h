@@ -10,7 +10,7 @@
 
 namespace NQRVZEP20 {
 
-// Reports how much of a slow step is done.
+// Reports how much of a slow step is done. `all` is at least `done`: it grows if there is more than the controller reported.
 using TProgress = std::function<void(char const* step, std::size_t done, std::size_t all)>;
 
 // The sensor data records of a controller, each with its header.

@@ -28,8 +28,9 @@ protected:
     fController.fRecords = {FullSensorRecord(0, 0x30, "CPU Temp"), CompactSensorRecord(1, 0x51, 8, "PSU 1")};
   }
 
-  TFinding<TSdrRepository> Read(ISdrCache const* cache = nullptr) {
-    return ReadSdrRepository(fController.Connection(), cache, [&](char const*, std::size_t done, std::size_t all) {
+  TFinding<TSdrRepository> Read(ISdrCache const* cache = nullptr) { return Read(fController.Connection(), cache); }
+  TFinding<TSdrRepository> Read(TIpmi const& ipmi, ISdrCache const* cache) {
+    return ReadSdrRepository(ipmi, cache, [&](char const*, std::size_t done, std::size_t all) {
       fProgress += std::to_string(done) + "/" + std::to_string(all) + " ";
     });
   }
@@ -44,6 +45,16 @@ TEST_F(SdrRepositoryTest, EveryRecordIsRead) {
   EXPECT_EQ(repository->fRecords, fController.fRecords);
   EXPECT_TRUE(repository->fIsComplete);
   EXPECT_EQ(fProgress, "1/2 2/2 ");
+}
+
+TEST_F(SdrRepositoryTest, MoreRecordsThanReportedAreRead) {
+  TIpmi const ipmi = [&, connection = fController.Connection()](TIpmiRequest const& request) -> TFinding<std::string> {
+    std::string answer = *connection(request);
+    if (request.fNetFn == kStorage && request.fCommand == 0x20) answer[2] = 1;  // the number of records
+    return answer;
+  };
+  EXPECT_EQ(Read(ipmi, nullptr)->fRecords, fController.fRecords);
+  EXPECT_EQ(fProgress, "1/1 2/2 ");
 }
 
 TEST_F(SdrRepositoryTest, AControllerThatRefusesLongPartsIsAskedForShortOnes) {
