@@ -344,6 +344,39 @@ TEST(RulesTest, ModulesAreComparedWithinTheirChannel) {
   EXPECT_EQ(Outcome("memory-differs", Module("0", "BANK 0", "8") + Module("1", "BANK 0", "16")), "not-asked");
 }
 
+// The forms in which the firmware of many makers labels modules: the locator, the bank, and the channel in one of them.
+TEST(RulesTest, ModulesAreNotComparedIfTheirLabelsNameNoChannel) {
+  struct {
+    char const *fLocator, *fBank, *fChannel;
+  } const rows[] = {{"P1-DIMMA1", "P0_Node0_Channel0_Dimm0", "P0_Node0_Channel0"},
+                    {"CPU1_DIMM_A1", "NODE 1 CHANNEL 0 DIMM 0", "NODE 1 CHANNEL 0"},
+                    {"DIMM 0", "P0 CHANNEL A", "P0 CHANNEL A"},
+                    {"ChannelA-DIMM0", "BANK 0", "ChannelA"},
+                    {"Controller1-ChannelB-DIMM1", "BANK 3", "Controller1-ChannelB"},
+                    {"CPU1_CHANNEL_B_DIMM0", "", "CPU1_CHANNEL_B"},
+                    {"A1", "", nullptr},
+                    {"PROC 2 DIMM 12", "Not Specified", nullptr},
+                    {"DIMM_A1", "BANK 0", nullptr},
+                    {"Node0_Dimm1", "Node0_Bank0", nullptr},
+                    {"System Board Slot Channels", "", nullptr}};
+  for (auto const& row : rows) {
+    auto const modules = [&](char const* second) {
+      std::string text;
+      for (std::string const module : {"\"1\"; Capacity = 8", second})
+        text += "instance of CIM_PhysicalMemory { Tag = " + module + "; ElementName = \"" + row.fLocator + "\"; BankLabel = \"" +
+                row.fBank + "\"; };";
+      return text;
+    };
+    std::string const rule = "memory-differs", different = modules("\"2\"; Capacity = 16");
+    EXPECT_THAT(Problems(rule, modules("\"2\"; Capacity = 8")), IsEmpty()) << row.fLocator;
+    if (row.fChannel == nullptr) {
+      EXPECT_EQ(Outcome(rule, different), "not-asked") << row.fLocator;
+    } else {
+      EXPECT_THAT(Problems(rule, different), ElementsAre(testing::HasSubstr("the channel " + std::string(row.fChannel) + " do")));
+    }
+  }
+}
+
 TEST(RulesTest, AModuleOfAChannelWithoutACapacityIsNotExamined) {
   std::string const modules = Module("0", "P0 CHANNEL A", "8") + Module("1", "P0 CHANNEL A", "NULL");
   auto const missing = Missing("CIM_PhysicalMemory.Tag=\\\"1\\\"", "Capacity", "not-given");

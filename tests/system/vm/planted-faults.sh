@@ -1,9 +1,9 @@
 #!/bin/sh
 # SPDX-License-Identifier: Apache-2.0
 #
-# Plants faults in a virtual machine: an array member that is pulled out while it is used, a full file system, an unplugged cable, a process killed for lack of
-# memory, a disk with errors, a machine check, a sensor beyond its threshold, and a clock that is not synchronised. zep must find
-# each with its remedy, nothing before, and nothing after they are mended.
+# Plants faults in a virtual machine: an array member that is pulled out while it is used, a full file system, an unplugged
+# cable, a process killed for lack of memory, a disk with errors, a machine check, a sensor beyond its threshold, and a clock
+# that is not synchronised. zep must find each with its remedy, nothing before, and nothing after they are mended.
 #
 #   planted-faults.sh BUILD [DIRECTORY]    exit status: 0 if it does, otherwise 1; 77 if a program is missing, unless CI is "true"
 #
@@ -12,7 +12,7 @@
 #
 # Needs: what run-in-vm.sh needs, and the packages mdadm, dmsetup, iproute2, e2fsprogs, perl, python3.
 set -eu
-[ $# -ge 1 ] || { sed -n '3,15s/^# \{0,1\}//p' "$0" >&2; exit 2; }
+[ $# -ge 1 ] || { sed -n '3,13s/^# \{0,1\}//p' "$0" >&2; exit 2; }
 here=$(cd "$(dirname "$0")" && pwd)
 build=$(cd "$1" && pwd) outputs=${2:-}
 for program in perl mdadm dmsetup ip mkfs.ext4 python3 qemu-system-x86_64; do
