@@ -195,6 +195,21 @@ TEST_F(InventoryTest, TheSensorRecordsAreReadFromTheCacheTheSecondTime) {
   EXPECT_EQ(Instance(Inventory(), "CIM_NumericSensor", "ElementName", "Cached 1")["CurrentReading"]["value"], 91);
 }
 
+// In the cached record of the fan, another unit.
+TEST_F(InventoryTest, ReadingsHaveTheirUnits) {
+  Inventory();
+  std::string const path = fDir.Path("cache/zep/sdr-127.0.0.1"), records = ReadFile(path);
+  std::size_t const line = records.rfind('\n', records.find("46616e2031")) + 1;  // "Fan 1"
+  auto const readingIn = [&](std::string const& unit) {
+    constexpr std::size_t place = 20, digits = 2;  // of the kinds of unit in the record; the unit follows
+    WriteFile(path, std::string(records).replace(line + place * digits, unit.size(), unit));
+    return Run({"127.0.0.1", "--inventory"}).fOutput;
+  };
+  EXPECT_THAT(readingIn("0012"), HasSubstr("4500 RPM"));
+  EXPECT_THAT(readingIn("1846"), HasSubstr("4500 Bytes Per Second"));
+  EXPECT_THAT(readingIn("1855"), HasSubstr("4500 (unit: packets per s)"));
+}
+
 TEST_F(InventoryTest, ProgressIsShownOnATerminal) {
   std::string const zep = fZep.Path("bin/zep") + " remote 127.0.0.1 --user zepadmin --inventory";
   std::string const command = "TERM=xterm ZEP_BMC_PASSWORD=zeppass1 XDG_CACHE_HOME=" + fDir.Path("cache") + " script -qec '" +
