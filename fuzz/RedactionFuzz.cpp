@@ -35,11 +35,15 @@ void RedactAndBack(std::string const& text) {
   index.Add(ESecretKind::kUsers, "(bob)");
   TPseudonyms pseudonyms("1");
   std::string const redacted =
-      index.Rewritten(text, [&](TSecret const* secret, std::string const& spelling) { return pseudonyms.For(secret, spelling); });
-  std::string const back = TSecretIndex().Rewritten(redacted, [&](TSecret const*, std::string const& pseudonym) {
-    Require(pseudonyms.SpellingOf(pseudonym) != nullptr);
-    return *pseudonyms.SpellingOf(pseudonym);
-  });
+      index.Rewritten(text, [&](TSecret const* secret, std::string const& spelling) { return pseudonyms.For(secret, spelling); })
+          .value_or(text);
+  std::string const back = TSecretIndex()
+                               .Rewritten(redacted,
+                                          [&](TSecret const*, std::string const& pseudonym) {
+                                            Require(pseudonyms.SpellingOf(pseudonym) != nullptr);
+                                            return *pseudonyms.SpellingOf(pseudonym);
+                                          })
+                               .value_or(redacted);
   Require(back == text);
 }
 

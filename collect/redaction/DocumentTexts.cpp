@@ -4,7 +4,7 @@
 #include "collect/redaction/Texts.h"
 
 #include <algorithm>
-#include <unordered_set>
+#include <set>
 
 namespace NQRVZEP20 {
 
@@ -28,12 +28,12 @@ bool IsIdentifierByte(char byte) { return byte == '_' || IsLetterOrDigit(byte); 
 
 // Whether the object is a property whose value is a number or a time, perhaps as a text.
 bool IsNumber(TJson const& object) {
+  constexpr std::string_view numbers[] = {"uint", "sint", "real", "boolean", "datetime"};
   auto const type = object.find("type");
   if (type == object.end() || !type->is_string()) return false;
-  auto const& name = type->get_ref<std::string const&>();
-  for (char const* number : {"uint", "sint", "real", "boolean", "datetime"})
-    if (name.rfind(number, 0) == 0) return true;
-  return false;
+  std::string_view const name = type->get_ref<std::string const&>();
+  return std::any_of(std::begin(numbers), std::end(numbers),
+                     [&](std::string_view number) { return name.substr(0, number.size()) == number; });
 }
 
 class TTextWriter {
@@ -73,15 +73,16 @@ private:
 
   // The size of the namespace and the class with which an object path begins; 0 of any other text.
   std::size_t BeginOfKeys(std::string const& text) const {
+    std::string_view const view = text;
     std::size_t const colon = text.find(':');
-    if (colon == text.npos || fNamespaces.count(text.substr(0, colon)) == 0) return 0;
+    if (colon == text.npos || fNamespaces.count(view.substr(0, colon)) == 0) return 0;
     std::size_t end = colon + 1;
     while (end < text.size() && IsIdentifierByte(text[end])) ++end;
-    return fClasses.count(text.substr(colon + 1, end - colon - 1)) == 0 ? 0 : end;
+    return fClasses.count(view.substr(colon + 1, end - colon - 1)) == 0 ? 0 : end;
   }
 
   TUseText const& fUse;
-  std::unordered_set<std::string> fNamespaces, fClasses;
+  std::set<std::string, std::less<>> fNamespaces, fClasses;
 };
 
 }  // namespace

@@ -50,6 +50,15 @@ bool IsMessage(std::string_view member) {
   return member == "reason" || member == "error" || member == "lastLogLine" || member == "words" || member == "note";
 }
 
+// Adds a member. The library would copy all other members, of any size.
+void AddLast(TJson& object, char const* name, TJson value) {
+  TJson::object_t members;
+  members.reserve(object.size() + 1);
+  for (auto& [key, member] : object.get_ref<TJson::object_t&>()) members.emplace(key, std::move(member));
+  members.emplace(name, std::move(value));
+  object = std::move(members);
+}
+
 // Collects the secrets of a document.
 class TCollector {
 public:
@@ -186,7 +195,7 @@ void Redact(TJson& document, TKinds const& kinds, TPseudonyms& pseudonyms) {
   RewriteTexts(document, [&](std::string_view text, TPlace const&) { return index.Rewritten(text, replace); });
   TJson names = TJson::array();
   for (ESecretKind const kind : kinds) names.push_back(NameOf(kind));
-  document[kRedaction] = {{"kinds", names}, {"map", pseudonyms.Id()}};
+  AddLast(document, kRedaction, {{"kinds", names}, {"map", pseudonyms.Id()}});
 }
 
 void Unredact(TJson& document, TPseudonyms const& pseudonyms) {

@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <iterator>
+#include <unordered_map>
 
 namespace NQRVZEP20 {
 
@@ -126,6 +127,16 @@ bool Has(TList const& list, std::string_view text) {
   return std::find(std::begin(list), std::end(list), text) != std::end(list);
 }
 
+// The rows for each property.
+std::unordered_multimap<std::string_view, TSecretProperty const*> const& RowsByProperty() {
+  static auto const rows = [] {
+    std::unordered_multimap<std::string_view, TSecretProperty const*> map;
+    for (TSecretProperty const& row : kProperties) map.emplace(row.fProperty, &row);
+    return map;
+  }();
+  return rows;
+}
+
 bool IsOf(TSecretProperty const& row, std::vector<std::string> const& classes) {
   return row.fClass.empty() || Has(classes, row.fClass);
 }
@@ -143,9 +154,9 @@ bool IsOneCharacter(std::string_view text) {
 }  // namespace
 
 std::optional<ESecretKind> KindOfProperty(std::vector<std::string> const& classes, std::string_view property) {
-  for (TSecretProperty const& row : kProperties)
-    if (row.fProperty == property && IsOf(row, classes)) return row.fKind;
-  return std::nullopt;
+  auto const [first, last] = RowsByProperty().equal_range(property);
+  auto const row = std::find_if(first, last, [&](auto const& each) { return IsOf(*each.second, classes); });
+  return row == last ? std::nullopt : std::optional(row->second->fKind);
 }
 
 std::optional<ESecretKind> KindOfRow(std::string_view key) {

@@ -34,7 +34,7 @@ struct TParts {
 TParts PartsOf(std::string_view text) {
   constexpr std::size_t mostDigits = 9;
   for (std::string_view const prefix : kPrefixes) {
-    if (text.substr(0, prefix.size()) != prefix || text.substr(prefix.size(), 1) != "-") continue;
+    if (text.size() <= prefix.size() || text[prefix.size()] != '-' || text.substr(0, prefix.size()) != prefix) continue;
     std::size_t const begin = prefix.size() + 1;
     std::size_t const letter = std::min(text.find_first_not_of("0123456789", begin), text.size());
     std::size_t const end = std::min(text.find_first_not_of("abcdefghijklmnopqrstuvwxyz", letter), text.size());

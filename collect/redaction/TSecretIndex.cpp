@@ -7,6 +7,7 @@
 #include "collect/redaction/Texts.h"
 
 #include <algorithm>
+#include <cstdint>
 #include <set>
 
 namespace NQRVZEP20 {
@@ -15,14 +16,23 @@ namespace {
 
 constexpr std::size_t kPartSize = 6;  // the bytes by which a part of a word is found
 
-// A hash of the first bytes, in lower case.
-std::size_t HashOf(std::string_view text, std::size_t size) {
-  std::size_t hash = 0;
-  for (std::size_t at = 0; at < size; ++at) hash = hash * 31 + static_cast<unsigned char>(Lower(text[at]));
-  return hash % 4096;
+// A hash of the text in lower case.
+std::uint32_t HashOf(std::string_view text) {
+  std::uint32_t hash = 0;
+  for (char const byte : text) hash = hash * 31 + static_cast<unsigned char>(Lower(byte));
+  return hash;
 }
 
-bool HasDigit(std::string_view text) { return text.find_first_of("0123456789") != text.npos; }
+// The hash of kPartSize bytes after `first`, from that of kPartSize bytes with `first`, which lack `next`.
+std::uint32_t NextHash(std::uint32_t hash, char first, char next) {
+  constexpr std::uint32_t weight = 31 * 31 * 31 * 31 * 31;  // of the first of six bytes
+  hash -= weight * static_cast<unsigned char>(Lower(first));
+  return hash * 31 + static_cast<unsigned char>(Lower(next));
+}
+
+bool HasDigit(std::string_view text) {
+  return std::any_of(text.begin(), text.end(), [](char byte) { return byte >= '0' && byte <= '9'; });
+}
 
 bool IsLetters(std::string_view text) {
   return std::all_of(text.begin(), text.end(), [](char byte) { return Lower(byte) >= 'a' && Lower(byte) <= 'z'; });
@@ -61,7 +71,7 @@ void TSecretIndex::AddSpelling(TSpelling spelling) {
   while (spelling.fPrefix < text.size() && SizeOfWordCharacter(text, spelling.fPrefix) == 0) ++spelling.fPrefix;
   std::string const word = Lower(text.substr(spelling.fPrefix, EndOfWord(text, spelling.fPrefix) - spelling.fPrefix));
   if (word.empty()) return;
-  fWords.set(HashOf(word, word.size()));
+  fWords.set(HashOf(word) % kHashes);
   auto& known = fSpellings[word];
   auto const isShorter = [&](TSpelling const& other) { return other.fText.size() < text.size(); };
   known.insert(std::find_if(known.begin(), known.end(), isShorter), std::move(spelling));
@@ -69,7 +79,7 @@ void TSecretIndex::AddSpelling(TSpelling spelling) {
 
 void TSecretIndex::AddPart(std::string const& text, std::size_t secret) {
   if (text.size() < kPartSize || !HasDigit(text) || EndOfWord(text, 0) != text.size()) return;
-  fBegins.set(HashOf(text, kPartSize));
+  fBegins.set(HashOf(text.substr(0, kPartSize)) % kHashes);
   fParts[text.substr(0, kPartSize)].push_back({text, 0, secret, false});
 }
 
@@ -79,7 +89,7 @@ TSecretCounts TSecretIndex::Counts() const {
   return counts;
 }
 
-std::string TSecretIndex::Rewritten(std::string_view text, TReplace const& replace) const {
+std::optional<std::string> TSecretIndex::Rewritten(std::string_view text, TReplace const& replace) const {
   std::string result;
   std::size_t copied = 0;
   for (std::size_t at = 0; at < text.size();) {
@@ -91,6 +101,7 @@ std::string TSecretIndex::Rewritten(std::string_view text, TReplace const& repla
     result += replace(hit.fSecret, std::string(text.substr(hit.fBegin, hit.fEnd - hit.fBegin)));
     at = copied = hit.fEnd;
   }
+  if (copied == 0) return std::nullopt;
   return result += text.substr(copied);
 }
 
@@ -108,7 +119,7 @@ TSecretIndex::THit TSecretIndex::HitAt(std::string_view text, std::size_t from, 
 TSecretIndex::TSpelling const* TSecretIndex::LongestAt(std::string_view text, std::size_t from, std::size_t begin,
                                                        std::size_t end) const {
   std::string_view const word = text.substr(begin, end - begin);
-  if (!fWords.test(HashOf(word, word.size()))) return nullptr;
+  if (fSecrets.empty() || !fWords.test(HashOf(word) % kHashes)) return nullptr;
   auto const found = fSpellings.find(Lower(word));
   if (found == fSpellings.end()) return nullptr;
   for (TSpelling const& spelling : found->second) {
@@ -122,13 +133,20 @@ TSecretIndex::TSpelling const* TSecretIndex::LongestAt(std::string_view text, st
 }
 
 TSecret const* TSecretIndex::SecretIn(std::string_view word) const {
-  for (std::size_t at = 0; at + kPartSize <= word.size(); ++at) {
-    if (!fBegins.test(HashOf(word.substr(at), kPartSize))) continue;
-    auto const found = fParts.find(Lower(word.substr(at, kPartSize)));
-    if (found == fParts.end()) continue;
-    for (TSpelling const& part : found->second)
-      if (IsSame(word.substr(at, part.fText.size()), part.fText, false)) return &fSecrets[part.fSecret];
+  if (fParts.empty() || word.size() < kPartSize || !HasDigit(word)) return nullptr;
+  std::uint32_t hash = HashOf(word.substr(0, kPartSize));
+  for (std::size_t at = 0;; ++at) {
+    TSecret const* const secret = fBegins.test(hash % kHashes) ? PartAt(word, at) : nullptr;
+    if (secret != nullptr || at + kPartSize == word.size()) return secret;
+    hash = NextHash(hash, word[at], word[at + kPartSize]);
   }
+}
+
+TSecret const* TSecretIndex::PartAt(std::string_view word, std::size_t at) const {
+  auto const found = fParts.find(Lower(word.substr(at, kPartSize)));
+  if (found == fParts.end()) return nullptr;
+  for (TSpelling const& part : found->second)
+    if (IsSame(word.substr(at, part.fText.size()), part.fText, false)) return &fSecrets[part.fSecret];
   return nullptr;
 }
 

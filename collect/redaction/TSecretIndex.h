@@ -6,6 +6,7 @@
 #include <bitset>
 #include <cstddef>
 #include <functional>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <unordered_map>
@@ -35,10 +36,12 @@ public:
   // Returns the replacement of a spelling. `secret` is null for a text that only looks like a pseudonym (TPseudonyms.h).
   using TReplace = std::function<std::string(TSecret const* secret, std::string const& spelling)>;
 
-  // The text with each spelling of a secret replaced.
-  std::string Rewritten(std::string_view text, TReplace const& replace) const;
+  // The text with each spelling of a secret replaced; none if it has none.
+  std::optional<std::string> Rewritten(std::string_view text, TReplace const& replace) const;
 
 private:
+  static constexpr std::size_t kHashes = 1 << 16;
+
   struct TSpelling {
     std::string fText;
     std::size_t fPrefix;  // the number of bytes before its first word
@@ -55,12 +58,13 @@ private:
   THit HitAt(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const;
   TSpelling const* LongestAt(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const;
   TSecret const* SecretIn(std::string_view word) const;
+  TSecret const* PartAt(std::string_view word, std::size_t at) const;
 
   std::vector<TSecret> fSecrets;
   std::unordered_set<std::string> fValues;                             // of the secrets
   std::unordered_map<std::string, std::vector<TSpelling>> fSpellings;  // by the first word, in lower case; the longest first
   std::unordered_map<std::string, std::vector<TSpelling>> fParts;      // of longer words, by their first bytes
-  std::bitset<4096> fWords, fBegins;                                   // hashes of both keys
+  std::bitset<kHashes> fWords, fBegins;                                // hashes of both keys
 };
 
 }  // namespace NQRVZEP20

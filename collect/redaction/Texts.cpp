@@ -32,10 +32,13 @@ bool IsWordBefore(std::string_view text, std::size_t end) {
 
 bool IsAddress(int family, std::string_view text) {
   in6_addr address;
-  return text.size() < INET6_ADDRSTRLEN && ::inet_pton(family, std::string(text).c_str(), &address) == 1;
+  bool const hasMarks = std::count(text.begin(), text.end(), family == AF_INET ? '.' : ':') >= 2;
+  return hasMarks && text.size() < INET6_ADDRSTRLEN && ::inet_pton(family, std::string(text).c_str(), &address) == 1;
 }
 
-bool IsAddressByte(char byte) { return IsHex({&byte, 1}) || byte == ':' || byte == '.' || byte == '-'; }
+bool IsHexDigit(char byte) { return (byte >= '0' && byte <= '9') || (Lower(byte) >= 'a' && Lower(byte) <= 'f'); }
+
+bool IsAddressByte(char byte) { return IsHexDigit(byte) || byte == ':' || byte == '.' || byte == '-'; }
 
 // Without the marks that end a sentence or a name: "192.0.2.1." and "eth0: 52:54:...:" keep only the address.
 std::string_view WithoutMarks(std::string_view text) {
@@ -83,7 +86,7 @@ std::string Lower(std::string_view text) {
   return lower;
 }
 
-bool IsHex(std::string_view text) { return !text.empty() && text.find_first_not_of("0123456789abcdefABCDEF") == text.npos; }
+bool IsHex(std::string_view text) { return !text.empty() && std::all_of(text.begin(), text.end(), IsHexDigit); }
 
 std::size_t SizeOfWordCharacter(std::string_view text, std::size_t at) {
   if (at >= text.size()) return 0;
@@ -103,7 +106,12 @@ std::string Compact(std::string_view text) {
 }
 
 std::size_t EndOfWord(std::string_view text, std::size_t at) {
-  while (std::size_t const size = SizeOfWordCharacter(text, at)) at += size;
+  std::size_t size = 0;
+  do {
+    while (at < text.size() && IsLetterOrDigit(text[at])) ++at;
+    size = SizeOfWordCharacter(text, at);
+    at += size;
+  } while (size > 0);
   return at;
 }
 
@@ -119,15 +127,22 @@ bool IsMac(std::string_view text) {
   constexpr std::size_t length = 17;
   if (text.size() != length || (text[2] != ':' && text[2] != '-')) return false;
   for (std::size_t at = 0; at < length; ++at)
-    if (at % 3 == 2 ? text[at] != text[2] : !IsHex(text.substr(at, 1))) return false;
+    if (at % 3 == 2 ? text[at] != text[2] : !IsHexDigit(text[at])) return false;
   return true;
 }
 
 std::vector<std::string> AddressesIn(std::string_view text, bool withIPv4) {
+  constexpr std::size_t shortest = 3;  // "::1"
   std::vector<std::string> addresses;
+  bool const hasMarks = std::count(text.begin(), text.end(), ':') >= 2 || std::count(text.begin(), text.end(), '-') >= 5;
+  if (!withIPv4 && !hasMarks) return addresses;
   for (std::size_t at = 0; at < text.size();) {
     std::size_t end = at;
     while (end < text.size() && IsAddressByte(text[end])) ++end;
+    if (end - at < shortest) {
+      at = end + 1;
+      continue;
+    }
     std::string_view const token = WithoutMarks(text.substr(at, end - at));
     bool const isWhole = IsWordBound(text, at, end);
     if (isWhole && (IsMac(token) || IsIPv6(token) || (withIPv4 && IsIPv4(token))))
@@ -144,7 +159,7 @@ std::vector<std::string> UuidsIn(std::string_view text) {
   auto const isUuid = [](std::string_view token) {
     for (std::size_t at = 0; at < length; ++at) {
       bool const isHyphen = at == 8 || at == 13 || at == 18 || at == 23;
-      if (isHyphen ? token[at] != '-' : !IsHex(token.substr(at, 1))) return false;
+      if (isHyphen ? token[at] != '-' : !IsHexDigit(token[at])) return false;
     }
     return true;
   };
