@@ -18,6 +18,7 @@
 #include "tools/zep/commands/Providers.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Failure.h"
+#include "tools/zep/output/InstanceJson.h"
 #include "tools/zep/output/InstanceText.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"

@@ -8,6 +8,7 @@
 #include "tools/zep/controller/Inventory.h"
 #include "tools/zep/output/FindingsJson.h"
 #include "tools/zep/output/FindingsText.h"
+#include "tools/zep/output/InstanceJson.h"
 #include "tools/zep/output/SectionText.h"
 
 #include <cmath>

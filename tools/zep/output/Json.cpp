@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/output/Json.h"
 
-#include "ICIMClass.h"
-#include "collect/UnitText.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/secrets/Secrets.h"
 
@@ -17,29 +15,11 @@ namespace {
 
 using TType = TCIMValue::TCIMType;
 
-constexpr std::size_t kUsualProperties = 32;
-
-// An object with room for that many members: when it grows, the library copies those that it has, with everything below them.
-TJson ObjectFor(std::size_t members) {
-  TJson json = TJson::object();
-  json.get_ref<TJson::object_t&>().reserve(members);
-  return json;
-}
-
 TJson RealAsJson(double real, std::string const& text) { return std::isfinite(real) ? TJson(real) : TJson(text); }
 
 TJson ArrayAsJson(std::vector<TCIMValue> const& elements) {
   TJson array = TJson::array();
   for (TCIMValue const& element : elements) array.push_back(ValueAsJson(element));
-  return array;
-}
-
-// The word for the value, or the words for the elements of an array; null where there is none.
-TJson WordsAsJson(TValueWords const& words, TCIMValue const& value) {
-  if (words.Entries().empty() || value.IsNull()) return nullptr;
-  if (!value.IsArray()) return OrNull(words.WordFor(value));
-  TJson array = TJson::array();
-  for (TCIMValue const& element : static_cast<std::vector<TCIMValue>&>(value)) array.push_back(WordsAsJson(words, element));
   return array;
 }
 
@@ -119,51 +99,6 @@ TJson ValueAsJson(TCIMValue const& value) {
 std::string NameOf(TCIMValue::TCIMType type) {
   if (type == TType::kCIMTypeInvalid) return "none";
   return type.ToString() + ((type & TType::kCIMTypeArrayFlag) != 0 ? "[]" : "");
-}
-
-TInstanceJson::TInstanceJson(TNamespaceView const& view) : fView(view) {}
-
-TJson TInstanceJson::Of(ICIMInstance const& instance) {
-  TJson json = ObjectFor(5);
-  json["path"] = fView.PathOf(instance);
-  json["provider"] = fView.GetProviderName();
-  json["namespace"] = fView.GetName();
-  json["class"] = instance.GetClass(TCIMContext())->GetName(TCIMContext());
-  TJson& properties = json["properties"] = ObjectFor(kUsualProperties);
-  instance.EnumerateProperties(
-      [&](boost::shared_ptr<ICIMProperty> property) {
-        properties[property->GetName(TCIMContext())] = PropertyAsJson(instance, *property);
-        return true;
-      },
-      TCIMContext());
-  return json;
-}
-
-TJson TInstanceJson::PropertyAsJson(ICIMInstance const& instance, ICIMProperty const& property) {
-  TCIMValue const value = property.GetValue(TCIMContext());
-  TDeclared const& declared = DeclaredBy(property.GetDeclaration(TCIMContext()));
-  TJson json = ObjectFor(7);
-  json["type"] = NameOf(value.GetType());
-  json["value"] = ValueAsJson(value);
-  TJson words = WordsAsJson(declared.fWords, value);
-  if (!words.is_null()) json["words"] = std::move(words);
-  if (!declared.fUnit.empty()) json["unit"] = declared.fUnit;
-  if (declared.fIsKey) json["key"] = true;
-  json["source"] = declared.fSource;
-  if (value.IsNull()) {
-    TMissing const why = fView.WhyMissing(instance, property.GetName(TCIMContext()));
-    json["code"] = why.fCode;
-    json["reason"] = why.fReason;
-  }
-  return json;
-}
-
-TInstanceJson::TDeclared const& TInstanceJson::DeclaredBy(TDeclaration const& declaration) {
-  auto const found = fDeclared.find(declaration);
-  if (found != fDeclared.end()) return found->second;
-  TDeclared declared{TValueWords(*declaration), UnitOf(*declaration), declaration->IsKey(TCIMContext()),
-                     fView.SourceOf(*declaration)};
-  return fDeclared.emplace(declaration, std::move(declared)).first->second;
 }
 
 }  // namespace NQRVZEP20::zep

@@ -1,12 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "ICIMInstance.h"
-#include "ICIMProperty.h"
-#include "ICIMPropertyDecl.h"
 #include "TCIMValue.h"
-#include "collect/TNamespaceView.h"
-#include "collect/TValueWords.h"
 #include "collect/stored/StoredDocument.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Failure.h"
@@ -14,8 +9,6 @@
 
 #include <nlohmann/json.hpp>
 
-#include <exception>
-#include <map>
 #include <string>
 
 namespace NQRVZEP20::zep {
@@ -40,6 +33,9 @@ std::string AsLine(TJson document);
 std::string AsVerbatimText(TJson const& document);
 std::string AsVerbatimLine(TJson const& document);
 
+// Whether passwords are hidden in messages, or not, for a document that is sent or stored.
+enum class EMessages { kWithoutSecrets, kVerbatim };
+
 // The text, or null if it is empty.
 TJson OrNull(std::string const& text);
 
@@ -54,31 +50,5 @@ TJson ValueAsJson(TCIMValue const& value);
 
 // The name of the type, followed by "[]" for an array.
 std::string NameOf(TCIMValue::TCIMType type);
-
-// Writes instances of a namespace. The declarations of their properties, which many instances share, are read once.
-//
-// Refers to the view, which must outlive the object.
-class TInstanceJson {
-public:
-  explicit TInstanceJson(TNamespaceView const& view);
-
-  // The instance with its path and all properties, each with type, value, unit, source, and for a missing value the reason.
-  TJson Of(ICIMInstance const& instance);
-
-private:
-  using TDeclaration = boost::shared_ptr<ICIMPropertyDecl const>;
-  struct TDeclared {
-    TValueWords fWords;
-    std::string fUnit;  // empty without one
-    bool fIsKey;
-    std::string fSource;
-  };
-
-  TJson PropertyAsJson(ICIMInstance const& instance, ICIMProperty const& property);
-  TDeclared const& DeclaredBy(TDeclaration const& declaration);
-
-  TNamespaceView const& fView;
-  std::map<TDeclaration, TDeclared> fDeclared;
-};
 
 }  // namespace NQRVZEP20::zep

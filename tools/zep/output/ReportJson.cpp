@@ -7,6 +7,7 @@
 #include "collect/FailureOf.h"
 #include "collect/Sections.h"
 #include "tools/zep/output/FindingsJson.h"
+#include "tools/zep/output/InstanceJson.h"
 #include "tools/zep/output/PlugInRows.h"
 #include "tools/zep/output/ReportPhrases.h"
 
@@ -73,16 +74,6 @@ std::string Now() {
 
 constexpr char const* kLineOfInstances = "\n  \"instances\": ";  // in no text of the document, which has no line ends
 
-// Appends the lines of a document, indented as an element of an array in a member of the outermost object.
-void AppendElement(std::string& array, std::string_view lines) {
-  constexpr char const* indentation = "\n    ";
-  array += indentation;
-  lines.remove_suffix(1);  // the last line end
-  for (std::size_t end; (end = lines.find('\n')) != lines.npos; lines.remove_prefix(end + 1))
-    array.append(lines.substr(0, end)).append(indentation);
-  array += lines;
-}
-
 // The instances, without those that follow a failure in their tree of classes. `failure`: the first one.
 std::vector<boost::shared_ptr<ICIMInstance>> ReadableInstances(TNamespaceView const& view, std::string& failure) {
   std::vector<boost::shared_ptr<ICIMInstance>> instances;
@@ -144,7 +135,8 @@ TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fM
 
 void TReportDocument::ReadInstances() {
   TJson instances = TJson::array();
-  TJson failures = ForEachInstance([&](TJson instance) { instances.push_back(std::move(instance)); });
+  TJson failures =
+      ForEachInstance(TJsonText::kOnOneLine, [&](std::string const& text) { instances.push_back(TJson::parse(text)); });
   fMembers["instances"] = std::move(instances);
   if (!failures.empty()) fMembers["instanceFailures"] = std::move(failures);
   fPlugIns = nullptr;
@@ -182,42 +174,46 @@ void TReportDocument::WriteLines(TWriter const& write) const {
   members.erase("instanceFailures");
   write(LineOf(std::move(members)));
   std::size_t count = 0;
-  TJson const failures = ForEachInstance([&](TJson instance) {
-    write(LineOf(std::move(instance)));
+  auto const writeLine = [&](std::string const& line) {
+    write(line);
     ++count;
-  });
+  };
+  TJson failures = fMembers.value("instanceFailures", TJson::array());
+  if (fPlugIns != nullptr)
+    failures = ForEachInstance(TJsonText::kOnOneLine, [&](std::string const& text) { writeLine(text + "\n"); });
+  else
+    for (TJson const& instance : fMembers.value("instances", TJson::array())) writeLine(LineOf(instance));
   write(LineOf({{"instances", count}, {"instanceFailures", failures}}));
 }
 
 // Writes the elements of the array, and returns the namespaces that failed while they were read.
 TJson TReportDocument::WriteInstances(TWriter const& write) const {
   constexpr std::size_t pieceSize = 65536;
+  constexpr int depth = 2;
   std::string piece;
   bool isFirst = true;
-  TJson failures = ForEachInstance([&](TJson instance) {
-    if (!std::exchange(isFirst, false)) piece += ',';
-    AppendElement(piece, TextOf(std::move(instance)));
-    if (piece.size() >= pieceSize) write(std::exchange(piece, std::string()));
+  TJson failures = ForEachInstance(depth, [&](std::string const& instance) {
+    piece.append(std::exchange(isFirst, false) ? "\n    " : ",\n    ").append(instance);
+    if (piece.size() < pieceSize) return;
+    write(piece);
+    piece.clear();
   });
   write(isFirst ? piece : piece + "\n  ");
   return failures;
 }
 
-// Converts one instance after the other. An instance that cannot be read is left out, and the first of a namespace is part of the
-// result; what `use` throws is passed on.
-TJson TReportDocument::ForEachInstance(std::function<void(TJson instance)> const& use) const {
+// Makes the text of one instance after the other. An instance that cannot be read is left out, and the first of a namespace is
+// part of the result; what `use` throws is passed on.
+TJson TReportDocument::ForEachInstance(int depth, TWriter const& use) const {
   TJson failures = TJson::array();
-  if (fPlugIns == nullptr) {
-    for (TJson const& instance : fMembers.value("instances", TJson::array())) use(instance);
-    return fMembers.value("instanceFailures", failures);
-  }
+  std::string text;
   for (TNamespaceView const& view : ViewsOf(*fPlugIns)) {
-    TInstanceJson json(view);
+    TInstanceJson json(view, fMessages);
     std::string failure;
     for (auto const& instance : ReadableInstances(view, failure)) {
-      TJson element;
-      std::string const why = FailureOf([&] { element = json.Of(*instance); });
-      if (why.empty()) use(std::move(element));
+      text.clear();
+      std::string const why = FailureOf([&] { json.Append(*instance, text, depth); });
+      if (why.empty()) use(text);
       if (failure.empty()) failure = why;
     }
     if (!failure.empty()) failures.push_back({{"provider", view.GetProviderName()}, {"error", failure}});

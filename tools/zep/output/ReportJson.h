@@ -11,9 +11,6 @@
 
 namespace NQRVZEP20::zep {
 
-// Whether passwords are hidden in messages (AsText in Json.h), or not, for a document that is sent or stored.
-enum class EMessages { kWithoutSecrets, kVerbatim };
-
 // A report as a document, with every instance of every namespace. Its exit status reflects the completeness of the report.
 //
 // The instances, which are most of it, are converted one by one while the document is written: the memory that they take does not
@@ -49,7 +46,7 @@ private:
   std::string TextOf(TJson json) const;
   std::string LineOf(TJson json) const;
   TJson WriteInstances(TWriter const& write) const;
-  TJson ForEachInstance(std::function<void(TJson instance)> const& use) const;
+  TJson ForEachInstance(int depth, TWriter const& use) const;
 
   EMessages fMessages = EMessages::kWithoutSecrets;
   TJson fMembers;
