@@ -57,6 +57,7 @@ struct TReport {
   std::optional<TSample> fSample;  // when the report is on a sample
   std::string fTableFile;          // the file named by ZEP_SMBIOS_TABLE; empty when there is none, and for a sample
   ECompleteness fCompleteness;
+  std::string fRecorded = {};  // when the machine was recorded: "2026-11-23T04:05:06Z"; empty for a machine that is read now
 
   // The row of the identity or the details with that key, which the report owns; null if there is none.
   TReportRow const* FindRow(std::string const& key) const;

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-// Machines whose files were recorded with tests/system/vm/record-machine.sh.
+// Machines that were recorded with zep record, or with tests/system/vm/record-machine.sh.
 
 #include "tests/Support.h"
 
@@ -11,9 +11,11 @@ namespace NQRVZEP20 {
 class TRecordedMachine {
 public:
   explicit TRecordedMachine(std::string const& name) {
-    std::string const archive = TestDataPath("machines/" + name + ".tar.gz");
-    int const status = std::system(("tar -C '" + fDir.Path() + "' -xzf '" + archive + "'").c_str());
-    EXPECT_EQ(status, 0) << archive << " cannot be unpacked";
+    std::string const recording = TestDataPath("machines/" + name + ".rec");
+    if (std::filesystem::exists(recording))
+      Unpack("--zstd --strip-components=1 -xpf '" + recording + "' root");
+    else
+      Unpack("-xzf '" + TestDataPath("machines/" + name + ".tar.gz") + "'");
     std::string const answers = TestDataPath("machines/" + name);
     if (std::filesystem::exists(answers)) std::filesystem::copy(answers, fDir.Path(), std::filesystem::copy_options::recursive);
   }
@@ -22,6 +24,10 @@ public:
   std::string Root() const { return fDir.Path(); }
 
 private:
+  void Unpack(std::string const& archive) {
+    EXPECT_EQ(std::system(("tar -C '" + fDir.Path() + "' " + archive).c_str()), 0) << archive << " cannot be unpacked";
+  }
+
   TTempDir fDir;
 };
 

@@ -29,7 +29,8 @@ TIpmi Connection() {
 
 // No cache while answers are recorded or read from a recording, because a recording has all of them.
 std::unique_ptr<ISdrCache> MakeCache(std::string const& identity) {
-  bool const isRecorded = !TMachineFiles::OfThisProcess().IsThisMachine() || std::getenv("ZEP_RECORD_ANSWERS") != nullptr;
+  TMachineFiles const files = TMachineFiles::OfThisProcess();
+  bool const isRecorded = !files.IsThisMachine() || files.IsBeingRecorded() || std::getenv("ZEP_RECORD_ANSWERS") != nullptr;
   if (gRemote == nullptr && isRecorded) return nullptr;
   return std::make_unique<TSdrCacheFile>(gRemote != nullptr ? gRemote->fName : "this-machine", identity);
 }

@@ -119,7 +119,7 @@ void WriteTpms(THostContext const& host) {
 }
 
 void WriteScsiDevices(THostContext const& host) {
-  std::string const directory = ScsiDirectory(host.fFiles);
+  TScsiPlace const directory = ScsiDirectory(host.fFiles);
   auto const devices = ScsiRecords(directory, host.fName);
   host.fWriter.Write(ScsiShape(host.fName), devices, WhyNoScsiDevices(directory));
   for (TRecord const& device : devices) host.fWriter.Associate(kSystemDevice, host.fSystem, device);

@@ -6,6 +6,7 @@
 #include <sys/utsname.h>
 
 #include <cstdlib>
+#include <sstream>
 
 namespace NQRVZEP20 {
 
@@ -13,18 +14,33 @@ namespace {
 
 std::string const kDirectory = "/proc/sys/kernel/";
 
-std::string Text(char const* text) { return text; }
+constexpr char const* kAnswer = "uname";
 
-TKernelNames NamesOfThisMachine() {
+// A line for each name.
+TFinding<std::string> AskKernel() {
   utsname kernel = {};
   ::uname(&kernel);
-  return {"uname", Text(kernel.sysname), Text(kernel.nodename), Text(kernel.release), Text(kernel.version), Text(kernel.machine)};
+  std::string lines;
+  for (char const* const name : {kernel.sysname, kernel.nodename, kernel.release, kernel.version, kernel.machine})
+    lines += std::string(name) + "\n";
+  return lines;
+}
+
+TKernelNames NamesFrom(TFinding<std::string> const& answer) {
+  std::istringstream lines(answer ? *answer : "");
+  auto const next = [&]() -> TFinding<std::string> {
+    std::string line;
+    if (!answer) return answer.Why();
+    if (!std::getline(lines, line)) return TMissing{kMissingUnexpected, "the answer of uname has fewer than five lines"};
+    return line;
+  };
+  return {kAnswer, next(), next(), next(), next(), next()};  // in this order: the list is braced
 }
 
 }  // namespace
 
 TKernelNames KernelNamesOf(TMachineFiles const& files) {
-  if (files.IsThisMachine()) return NamesOfThisMachine();
+  if (files.IsThisMachine() || files.HasAnswer(kAnswer)) return NamesFrom(files.Answer(kAnswer, AskKernel));
   return {kDirectory,
           files.Line(kDirectory + "ostype"),
           files.Line(kDirectory + "hostname"),

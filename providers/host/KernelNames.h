@@ -18,7 +18,7 @@ struct TKernelNames {
   TFinding<std::string> fArchitecture;  // "x86_64"
 };
 
-// From uname on this machine; of a recorded machine, from the files in /proc/sys/kernel.
+// From uname; of a recorded machine without its answer, from the files in /proc/sys/kernel.
 TKernelNames KernelNamesOf(TMachineFiles const& files);
 
 // The machine's host name, or the value of the environment variable ZEP_HOST_NAME, so that the table of another machine

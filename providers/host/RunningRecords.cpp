@@ -60,9 +60,11 @@ TText AskForFailedUnits() {
 }
 
 TFinding<std::vector<std::string>> FailedUnits(TMachineFiles const& files) {
-  bool const hasSystemd = files.Exists("/run/systemd/system") || !files.IsThisMachine();
-  if (!hasSystemd) return TMissing{kMissingNotApplicable, "systemd does not run on this machine"};
-  return files.Answer("systemctl/failed", AskForFailedUnits).Then(FailedUnitsFrom);
+  auto const ask = [&files]() -> TText {
+    if (!files.Exists("/run/systemd/system")) return TMissing{kMissingNotApplicable, "systemd does not run on this machine"};
+    return AskForFailedUnits();
+  };
+  return files.Answer("systemctl/failed", ask).Then(FailedUnitsFrom);
 }
 
 }  // namespace

@@ -6,15 +6,12 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
-#include <filesystem>
-#include <fstream>
 #include <tuple>
 
 namespace NQRVZEP20 {
 
 namespace {
 
-namespace fs = std::filesystem;
 using TText = TFinding<std::string>;
 
 constexpr char const* kClassName = "QRVSG_SCSIDevice";
@@ -52,28 +49,26 @@ bool operator<(TAddress const& a, TAddress const& b) {
   return std::tie(a.fHost, a.fChannel, a.fTarget, a.fLun) < std::tie(b.fHost, b.fChannel, b.fTarget, b.fLun);
 }
 
-std::vector<TAddress> AddressesIn(std::string const& directory) {
+std::vector<TAddress> AddressesIn(std::vector<std::string> const& names) {
   std::vector<TAddress> addresses;
-  std::error_code error;
-  for (fs::directory_iterator entry(directory, error), end; !error && entry != end; entry.increment(error)) {
-    TAddress address{0, 0, 0, 0, entry->path().filename().string()};
+  for (std::string const& name : names) {
+    TAddress address{0, 0, 0, 0, name};
     int length = 0;
-    std::sscanf(address.fText.c_str(), "%u:%u:%u:%lu%n", &address.fHost, &address.fChannel, &address.fTarget, &address.fLun,
-                &length);
-    if (length > 0 && static_cast<std::size_t>(length) == address.fText.size()) addresses.push_back(address);
+    std::sscanf(name.c_str(), "%u:%u:%u:%lu%n", &address.fHost, &address.fChannel, &address.fTarget, &address.fLun, &length);
+    if (length > 0 && static_cast<std::size_t>(length) == name.size()) addresses.push_back(address);
   }
   std::sort(addresses.begin(), addresses.end());
   return addresses;
 }
 
 // The only line of a file of sysfs, without the blanks with which SCSI pads its texts.
-TText ReadLine(std::string const& file) {
-  std::ifstream stream(file);
-  std::string line;
-  if (!std::getline(stream, line)) return TMissing{kMissingUnreadable, file + " cannot be read"};
-  std::size_t const first = line.find_first_not_of(' ');
-  if (first == std::string::npos) return TMissing{kMissingNotGiven, "the device reports only blanks"};
-  return line.substr(first, line.find_last_not_of(' ') - first + 1);
+TText ReadLine(TMachineFiles const& files, std::string const& file) {
+  return files.Content(file).Then([](std::string const& content) -> TText {
+    std::string const line = content.substr(0, content.find('\n'));
+    std::size_t const first = line.find_first_not_of(' ');
+    if (first == std::string::npos) return TMissing{kMissingNotGiven, "the device reports only blanks"};
+    return line.substr(first, line.find_last_not_of(' ') - first + 1);
+  });
 }
 
 TText DeviceTypeFrom(std::string const& number) {
@@ -99,19 +94,21 @@ TRecord MakeRecord(TSystemName const& name, TText const& id, TText const& type, 
 
 }  // namespace
 
-std::string ScsiDirectory(TMachineFiles const& files) {
+TScsiPlace ScsiDirectory(TMachineFiles const& files) {
   char const* const named = std::getenv("ZEP_SCSI_DEVICES");
-  return named != nullptr && *named != '\0' ? named : files.Outside(kKernelDirectory);
+  if (named != nullptr && *named != '\0') return {TMachineFiles("/"), named};
+  return {files, kKernelDirectory};
 }
 
-std::vector<TRecord> ScsiRecords(std::string const& directory, TSystemName const& name) {
+std::vector<TRecord> ScsiRecords(TScsiPlace const& directory, TSystemName const& name) {
+  auto const& [files, path] = directory;
   std::vector<TRecord> records;
-  for (TAddress const& address : AddressesIn(directory)) {
-    std::string const device = directory + "/" + address.fText + "/";
-    TText const type = ReadLine(device + "type");
+  for (TAddress const& address : AddressesIn(files.Names(path))) {
+    std::string const device = path + "/" + address.fText + "/";
+    TText const type = ReadLine(files, device + "type");
     if (!type) continue;
-    records.push_back(MakeRecord(name, address.fText, type.Then(DeviceTypeFrom), ReadLine(device + "vendor"),
-                                 ReadLine(device + "model"), ReadLine(device + "rev")));
+    records.push_back(MakeRecord(name, address.fText, type.Then(DeviceTypeFrom), ReadLine(files, device + "vendor"),
+                                 ReadLine(files, device + "model"), ReadLine(files, device + "rev")));
   }
   return records;
 }
@@ -121,9 +118,10 @@ TRecord ScsiShape(TSystemName const& name) {
   return MakeRecord(name, none, none, none, none, none);
 }
 
-TMissing WhyNoScsiDevices(std::string const& directory) {
-  if (!fs::exists(directory)) return {kMissingNotGiven, "the kernel lists no SCSI devices: " + directory + " does not exist"};
-  return {kMissingNotGiven, "no SCSI devices are listed in " + directory};
+TMissing WhyNoScsiDevices(TScsiPlace const& directory) {
+  std::string const& path = directory.fPath;
+  if (!directory.fFiles.Exists(path)) return {kMissingNotGiven, "the kernel lists no SCSI devices: " + path + " does not exist"};
+  return {kMissingNotGiven, "no SCSI devices are listed in " + path};
 }
 
 }  // namespace NQRVZEP20

@@ -12,14 +12,19 @@ namespace NQRVZEP20 {
 
 // The SCSI devices of this machine, including USB and SATA disks, as the kernel lists them.
 
+struct TScsiPlace {
+  TMachineFiles fFiles;
+  std::string fPath;
+};
+
 // The directory in which the kernel lists them, or for tests the one named by the environment variable ZEP_SCSI_DEVICES.
-std::string ScsiDirectory(TMachineFiles const& files);
+TScsiPlace ScsiDirectory(TMachineFiles const& files);
 
 // One record per device, in the order of their addresses. A device that is removed during the call is omitted.
-std::vector<TRecord> ScsiRecords(std::string const& directory, TSystemName const& name);
+std::vector<TRecord> ScsiRecords(TScsiPlace const& directory, TSystemName const& name);
 
 // A record without values, which declares the class, and the reason why there are no devices.
 TRecord ScsiShape(TSystemName const& name);
-TMissing WhyNoScsiDevices(std::string const& directory);
+TMissing WhyNoScsiDevices(TScsiPlace const& directory);
 
 }  // namespace NQRVZEP20

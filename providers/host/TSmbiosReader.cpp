@@ -12,6 +12,7 @@ namespace {
 
 constexpr char const* kTableFileVariable = "ZEP_SMBIOS_TABLE";
 constexpr char const* kKernelTable = "/sys/firmware/dmi/tables/DMI";
+constexpr char const* kKernelEntryPoint = "/sys/firmware/dmi/tables/smbios_entry_point";
 
 constexpr std::size_t kLargestStructure = 64 * 1024;  // a longer structure is truncated
 constexpr std::size_t kMostStructures = 4096;         // of one type: a library may return structures endlessly
@@ -24,6 +25,21 @@ std::string NamedFile() {
 // ": Too many open files"; empty when the library has left no errno.
 std::string Reason(int status, int error) {
   return status == kSmbiosFileSystemError && error != 0 ? ": " + std::generic_category().message(error) : "";
+}
+
+TMissing const kNeedsRoot{kMissingNeedsRoot, "only root can read the SMBIOS tables"};
+
+// The path at which libsmbios.so reads the kernel's tables. The entry point beside them is read there, too.
+std::string KernelFile(TMachineFiles const& files) {
+  files.Outside(kKernelEntryPoint);
+  return files.Outside(kKernelTable);
+}
+
+// The library does not know the marks of a recording.
+bool IsRefusedInRecording(TMachineFiles const& files, std::string const& namedFile) {
+  if (!namedFile.empty() || (files.IsThisMachine() && !files.IsBeingRecorded())) return false;
+  auto const start = files.Bytes(kKernelTable, 0, 1);
+  return !start && start.Why().fCode == kMissingNeedsRoot;
 }
 
 TMissing WhyNotLoaded(TLoadOutcome const& outcome) {
@@ -43,7 +59,7 @@ TMissing WhyTablesFailed(TSmbiosTables const& tables, std::string const& tableFi
     return {kMissingUnreadable, what + " does not contain an SMBIOS table"};
   }
   if (status == kSmbiosFileNotFound) return {kMissingNoTables, "the system exports no SMBIOS tables"};
-  if (status == kSmbiosAccessDenied) return {kMissingNeedsRoot, "only root can read the SMBIOS tables"};
+  if (status == kSmbiosAccessDenied) return kNeedsRoot;
   return {kMissingUnreadable, "the system's SMBIOS tables cannot be read" + Reason(status, error)};
 }
 
@@ -93,14 +109,12 @@ char const* NameOf(int type) {
 
 }  // namespace
 
-TSmbiosReader::TSmbiosReader(TMachineFiles const& files)
-    : fTables(std::make_unique<TSmbiosTables>(TSmbiosTables::kClosedWithTables)),
-      fNamedFile(NamedFile()),
-      fKernelFile(files.Outside(kKernelTable)) {
+TSmbiosReader::TSmbiosReader(TMachineFiles const& files) : fNamedFile(NamedFile()), fKernelFile(KernelFile(files)) {
+  fTables = std::make_unique<TSmbiosTables>(TSmbiosTables::kClosedWithTables);
   if (!fTables->Library())
     fWhyNot = WhyNotLoaded(fTables->Library());
   else if (!fTables->HasHandle())
-    fWhyNot = WhyTablesFailed(*fTables, fNamedFile);
+    fWhyNot = IsRefusedInRecording(files, fNamedFile) ? kNeedsRoot : WhyTablesFailed(*fTables, fNamedFile);
   if (!fTables->HasHandle()) fTables.reset();
 }
 

@@ -1,11 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TMachineFiles.h"
 
-#include <dirent.h>
+#include "RecordedMark.h"
+#include "RootedFiles.h"
+#include "TMachineCopy.h"
+
 #include <fcntl.h>
-#include <linux/openat2.h>
 #include <sys/stat.h>
-#include <sys/syscall.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -24,66 +25,7 @@ namespace {
 std::string const kAnswers = "/zep-answers/";
 constexpr std::size_t kAnswerLimit = std::size_t(16) << 20;
 
-class TFd {
-public:
-  explicit TFd(int fd) : fFd(fd) {}
-  TFd(TFd&& other) noexcept : fFd(std::exchange(other.fFd, -1)) {}
-  TFd& operator=(TFd&&) = delete;
-  ~TFd() {
-    if (fFd >= 0) ::close(fFd);
-  }
-
-  explicit operator bool() const { return fFd >= 0; }
-  int Get() const { return fFd; }
-  int Release() { return std::exchange(fFd, -1); }
-
-private:
-  int fFd;
-};
-
-// Opens a path below the root and leaves the reason of a failure in errno. O_NONBLOCK: opening a FIFO must not wait for its
-// writer.
-TFd OpenBelow(std::string const& root, std::string const& path, int flags) {
-  flags |= O_CLOEXEC;
-  if ((flags & O_PATH) == 0) flags |= O_NONBLOCK | O_NOCTTY;
-  if (root.empty()) return TFd(::open(path.c_str(), flags));
-  TFd const directory(::open(root.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC));
-  if (!directory) return TFd(-1);
-  open_how how = {};
-  how.flags = static_cast<unsigned>(flags);
-  how.resolve = RESOLVE_IN_ROOT;
-  // The kernel gives up at ".." with EAGAIN if anything on the machine was renamed or mounted meanwhile.
-  constexpr int attempts = 10000;
-  for (int attempt = 1;; ++attempt) {
-    int const fd = static_cast<int>(::syscall(SYS_openat2, directory.Get(), path.c_str(), &how, sizeof how));
-    if (fd >= 0 || errno != EAGAIN || attempt == attempts) return TFd(fd);
-  }
-}
-
-TMissing WhyUnreadable(std::string const& path, int error) {
-  if (error == ENOENT || error == ENOTDIR) return {kMissingNotGiven, path + " does not exist"};
-  if ((error == EACCES || error == EPERM) && ::geteuid() != 0) return {kMissingNeedsRoot, "only root may read " + path};
-  return {kMissingUnreadable, path + " cannot be read: " + std::strerror(error)};
-}
-
-bool IsRegularFile(int fd) {
-  struct stat status;
-  return ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode);
-}
-
-// Reads up to `limit` bytes, or to the end of the file. Returns false and leaves the reason in errno when reading fails.
-bool ReadUpTo(int fd, std::size_t limit, std::string& content) {
-  char buffer[4096];
-  while (content.size() < limit) {
-    ssize_t const count = ::read(fd, buffer, std::min(sizeof buffer, limit - content.size()));
-    if (count == 0) return true;
-    if (count > 0)
-      content.append(buffer, static_cast<std::size_t>(count));
-    else if (errno != EINTR)
-      return false;
-  }
-  return true;
-}
+TMissing WhyUnreadable(std::string const& path, int error) { return WhyRefused(path, {error, ::geteuid() == 0}); }
 
 // The path of an open file, as the kernel knows it; empty without /proc.
 std::string PathOf(TFd const& file) {
@@ -110,7 +52,12 @@ void Record(std::string const& path, std::string const& answer) {
 
 TMachineFiles TMachineFiles::OfThisProcess() {
   char const* const named = std::getenv("ZEP_ROOT");
-  return TMachineFiles(named != nullptr ? named : "/");
+  char const* const from = std::getenv("ZEP_RECORD_FROM");
+  TMachineFiles files(named != nullptr ? named : "/");
+  if (from == nullptr || files.fRoot.empty()) return files;
+  files.fSource = std::make_shared<TMachineFiles>(from);
+  files.fCopy = std::make_shared<TMachineCopy>(files.fSource->fRoot, files.fRoot);
+  return files;
 }
 
 TMachineFiles::TMachineFiles(std::string root) : fRoot(std::move(root)) {
@@ -125,12 +72,15 @@ TFinding<std::string> TMachineFiles::Content(std::string const& path, std::size_
 }
 
 TFinding<std::string> TMachineFiles::Bytes(std::string const& path, std::size_t offset, std::size_t length) const {
+  if (fCopy) fCopy->KeepBytes(path, offset, length);
   TFd const file = OpenBelow(fRoot, path, O_RDONLY);
   if (!file) return WhyUnreadable(path, errno);
-  if (!IsRegularFile(file.Get())) return TMissing{kMissingUnreadable, path + " is not a regular file"};
-  if (offset != 0 && ::lseek(file.Get(), static_cast<off_t>(offset), SEEK_SET) < 0) return WhyUnreadable(path, errno);
+  struct stat const status = StatusOf(file);
+  if (!S_ISREG(status.st_mode)) return TMissing{kMissingUnreadable, path + " is not a regular file"};
+  bool const isMark = !fRoot.empty() && IsMark(status);
   std::string content;
-  if (!ReadUpTo(file.Get(), length, content)) return WhyUnreadable(path, errno);
+  if (!ReadAt(file, isMark ? 0 : offset, isMark ? kLongestMark : length, content)) return WhyUnreadable(path, errno);
+  if (isMark) return WhyMarked(path, content);
   return content;
 }
 
@@ -143,30 +93,27 @@ TFinding<std::string> TMachineFiles::Line(std::string const& path) const {
 }
 
 std::vector<std::string> TMachineFiles::Names(std::string const& directory) const {
-  TFd fd = OpenBelow(fRoot, directory, O_RDONLY | O_DIRECTORY);
-  if (!fd) return {};
-  std::unique_ptr<DIR, int (*)(DIR*)> const entries(::fdopendir(fd.Get()), ::closedir);
-  if (!entries) return {};
-  fd.Release();  // owned by `entries` from here on
-  std::vector<std::string> names;
-  while (dirent const* const entry = ::readdir(entries.get())) names.emplace_back(entry->d_name);
-  names.erase(std::remove_if(names.begin(), names.end(), [](std::string const& name) { return name == "." || name == ".."; }),
-              names.end());
+  if (fCopy) fCopy->KeepNames(directory);
+  std::vector<std::string> names = NamesIn(OpenBelow(fRoot, directory, O_RDONLY | O_DIRECTORY));
   std::sort(names.begin(), names.end(),
             [](std::string const& a, std::string const& b) { return ::strverscmp(a.c_str(), b.c_str()) < 0; });
   return names;
 }
 
-bool TMachineFiles::Exists(std::string const& path) const { return static_cast<bool>(OpenBelow(fRoot, path, O_PATH)); }
+bool TMachineFiles::Exists(std::string const& path) const {
+  if (fCopy) fCopy->KeepPlace(path);
+  return static_cast<bool>(OpenBelow(fRoot, path, O_PATH));
+}
 
 TFinding<std::string> TMachineFiles::RealPath(std::string const& path) const {
-  if (IsThisMachine()) {
+  if (fCopy) fCopy->KeepPlace(path);
+  if (fRoot.empty()) {
     std::unique_ptr<char, void (*)(void*)> const real(::realpath(path.c_str(), nullptr), std::free);
     return real ? TFinding<std::string>(real.get()) : WhyUnreadable(path, errno);
   }
 
   // The kernel knows the path of an open file; the C library's realpath would follow absolute links out of the root.
-  TFd const root = OpenBelow("", Outside("/"), O_PATH);
+  TFd const root = OpenBelow("", fRoot + "/", O_PATH);
   TFd const file = OpenBelow(fRoot, path, O_PATH);
   if (!file) return WhyUnreadable(path, errno);
   std::string const above = PathOf(root), found = PathOf(file);
@@ -177,12 +124,28 @@ TFinding<std::string> TMachineFiles::RealName(std::string const& path) const {
   return RealPath(path).Then([](std::string const& real) { return real.substr(real.rfind('/') + 1); });
 }
 
+bool TMachineFiles::IsThisMachine() const { return fSource ? fSource->IsThisMachine() : fRoot.empty(); }
+
+std::string TMachineFiles::Outside(std::string const& path) const {
+  if (fCopy) fCopy->KeepBytes(path, 0, kAnswerLimit);
+  return fRoot + path;
+}
+
 TFinding<std::string> TMachineFiles::Answer(std::string const& name, std::function<TFinding<std::string>()> const& ask) const {
+  if (fCopy) {
+    TFinding<std::string> answer = fSource->Answer(name, ask);
+    fCopy->KeepAnswer(kAnswers + name, answer);
+    return answer;
+  }
   if (!IsThisMachine()) return Content(kAnswers + name, kAnswerLimit);
   TFinding<std::string> answer = ask();
   char const* const recording = std::getenv("ZEP_RECORD_ANSWERS");
   if (recording != nullptr && answer) Record(recording + (kAnswers + name), *answer);
   return answer;
+}
+
+bool TMachineFiles::HasAnswer(std::string const& name) const {
+  return fSource ? fSource->HasAnswer(name) : Exists(kAnswers + name);
 }
 
 bool IsSampleDescribed() { return std::getenv("ZEP_SAMPLE") != nullptr; }

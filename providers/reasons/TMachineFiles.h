@@ -6,11 +6,14 @@
 #include <charconv>
 #include <cstddef>
 #include <functional>
+#include <memory>
 #include <string>
 #include <type_traits>
 #include <vector>
 
 namespace NQRVZEP20 {
+
+class TMachineCopy;
 
 // The files that describe a machine, such as those below /sys and /proc. They are read below a root directory: "/" for the
 // machine itself, or a directory with the recorded files of another machine.
@@ -18,18 +21,27 @@ namespace NQRVZEP20 {
 // Paths are absolute, as on the described machine: "/sys/class/net". Symbolic links are followed within the root, so that a
 // recording cannot lead to a file outside it. Only regular files are read: a device or a FIFO is reported as unreadable. Every
 // operation asks the file system anew and blocks as long as it does. A plain value; several threads may use the same object.
+//
+// While a machine is being recorded (zep record), each operation first copies what it reads below another root, and then reads
+// the copy, so that the recording has by construction all that was read. A file that was read to its end is not read again.
 class TMachineFiles {
 public:
-  // The root that the environment variable ZEP_ROOT names, or "/".
+  // The root that the environment variable ZEP_ROOT names, or "/". If ZEP_RECORD_FROM names a root, too, the machine below that
+  // one is recorded below ZEP_ROOT.
   static TMachineFiles OfThisProcess();
 
   // `root`: a directory, with or without a slash at the end.
   explicit TMachineFiles(std::string root);
 
-  bool IsThisMachine() const { return fRoot.empty(); }
+  // Whether queries are answered by this machine, also while it is being recorded.
+  bool IsThisMachine() const;
 
-  // The path in the file system of this process. A library that opens it follows links without regard to the root.
-  std::string Outside(std::string const& path) const { return fRoot + path; }
+  // Whether what is read is being recorded: then a provider must not use what it keeps between its runs.
+  bool IsBeingRecorded() const { return fCopy != nullptr; }
+
+  // The path in the file system of this process, for a library that opens the file itself. It follows links without regard to
+  // the root.
+  std::string Outside(std::string const& path) const;
 
   // The content. Missing if the file does not exist, cannot be opened or read, is not a regular file, or is longer than
   // `limit` bytes.
@@ -64,8 +76,12 @@ public:
 
   // The answer to a query that is not made by reading a file, such as a system call or the output of a program. On this machine
   // it is the result of `ask`, which is also recorded below the directory that ZEP_RECORD_ANSWERS names, if set;
-  // otherwise it is the content of the recorded file /zep-answers/`name`, of at most 16 MiB. A missing answer is not recorded.
+  // otherwise it is the content of the recorded file /zep-answers/`name`, of at most 16 MiB. A missing answer is recorded with
+  // its reason by zep record, but not below ZEP_RECORD_ANSWERS.
   TFinding<std::string> Answer(std::string const& name, std::function<TFinding<std::string>()> const& ask) const;
+
+  // Whether the answer to the query is recorded, or the reason why it is missing. Always false on this machine.
+  bool HasAnswer(std::string const& name) const;
 
 private:
   template <class T>
@@ -83,7 +99,9 @@ private:
     return TMissing{kMissingUnexpected, path + " contains \"" + text + "\", which is not a number in the expected range"};
   }
 
-  std::string fRoot;  // without a slash at the end; empty for "/"
+  std::string fRoot;                             // without a slash at the end; empty for "/"
+  std::shared_ptr<TMachineFiles const> fSource;  // the machine that is being recorded, and its copy; null if none is
+  std::shared_ptr<TMachineCopy const> fCopy;
 };
 
 // Whether a front end describes a sample instead of this machine, which the environment variable ZEP_SAMPLE says. A sample

@@ -11,6 +11,7 @@
 #include <cerrno>
 #include <cstring>
 #include <deque>
+#include <functional>
 #include <utility>
 
 namespace NQRVZEP20 {
@@ -18,6 +19,7 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr char const* kPath = "/dev/kmsg";
+constexpr char const* kAnswer = "kmsg";
 
 // Collects the events of records that are given to it in the order of the log.
 class TCollector {
@@ -66,31 +68,48 @@ TMissing WhyUnreadable(int error) {
 
 std::string_view FirstLine(std::string_view text) { return text.substr(0, text.find('\n')); }
 
-// Each read returns one record. EPIPE: the next record was overwritten meanwhile, and reading goes on after the gap.
-TFinding<TKernelLog> ReadDevice(std::chrono::milliseconds limit) {
+// Calls `use` with the first line of each record. Returns whether the whole log was read within the time limit. Each read returns
+// one record. EPIPE: the next record was overwritten meanwhile, and reading goes on after the gap.
+TFinding<bool> ReadDevice(std::chrono::milliseconds limit, std::function<void(std::string_view)> const& use) {
   auto const end = std::chrono::steady_clock::now() + limit;
   TUniqueFd const device(::open(kPath, O_RDONLY | O_NONBLOCK | O_CLOEXEC | O_NOCTTY));
   if (!device) return WhyUnreadable(errno);
   ::lseek(device.get(), 0, SEEK_DATA);  // after the last clearing; otherwise reading begins at the oldest record
-  TCollector log;
-  std::string buffer(8192, '\0');  // the kernel's longest record
+  std::string buffer(8192, '\0');       // the kernel's longest record
   while (std::chrono::steady_clock::now() < end) {
     ssize_t const size = ::read(device.get(), buffer.data(), buffer.size());
     if (size > 0) {
-      log.Add(FirstLine({buffer.data(), static_cast<std::size_t>(size)}));
+      use(FirstLine({buffer.data(), static_cast<std::size_t>(size)}));
     } else if (size == 0 || errno == EAGAIN) {
-      return log.Finish(true);
+      return true;
     } else if (errno != EPIPE && errno != EINTR) {
       return WhyUnreadable(errno);
     }
   }
-  return log.Finish(false);
+  return false;
+}
+
+TFinding<TKernelLog> ReadThisMachine(std::chrono::milliseconds limit) {
+  TCollector log;
+  return ReadDevice(limit, [&](std::string_view line) { log.Add(line); }).Then([&](bool isWhole) { return log.Finish(isWhole); });
+}
+
+// The whole log, for a recording.
+TFinding<std::string> ReadText(std::chrono::milliseconds limit) {
+  std::string text;
+  auto const isWhole = ReadDevice(limit, [&](std::string_view line) { text.append(line) += '\n'; });
+  return isWhole.Then([&](bool whole) -> TFinding<std::string> {
+    if (whole) return text;
+    return TMissing{kMissingUnreadable, "the kernel's log could not be recorded within the time limit"};
+  });
 }
 
 }  // namespace
 
 TFinding<TKernelLog> ReadKernelLog(TMachineFiles const& files, std::chrono::milliseconds limit) {
-  if (files.IsThisMachine()) return ReadDevice(limit);
+  if (files.IsThisMachine() && !files.IsBeingRecorded()) return ReadThisMachine(limit);
+  if (files.IsThisMachine() || files.HasAnswer(kAnswer))
+    return files.Answer(kAnswer, [limit] { return ReadText(limit); }).Then(KernelLogFrom);
   auto const records = files.Content(kPath, kMostKernelBytes);
   if (!records && records.Why().fCode == kMissingNotGiven) return WhyUnreadable(ENOENT);
   return records.Then(KernelLogFrom);

@@ -35,6 +35,7 @@ constexpr char const* kIsEmpty = " must not be empty";
 
 constexpr TCommand kCommands[] = {
     {"report", "Report the identity and the hardware of this machine", AddReportArguments},
+    {"record", "Record what the plug-ins read of this machine, for zep report --replay", AddRecordArguments},
     {"diff", "Compare two stored reports", AddDiffArguments},
     {"show", "Print one object or class of the providers' namespaces, or of a MOF file", AddShowArguments},
     {"classes", "List the classes of the providers' namespaces, or of a MOF file", AddClassesArguments},

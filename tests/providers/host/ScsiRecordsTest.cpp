@@ -16,7 +16,7 @@ protected:
   // "DeviceID|DeviceType|VendorID|ProductID|ProductRevision" of each record, or the reason for a missing value.
   std::vector<std::string> Records() const {
     std::vector<std::string> texts;
-    for (TRecord const& record : ScsiRecords(fPath, {"db1", "uname"})) {
+    for (TRecord const& record : ScsiRecords({TMachineFiles("/"), fPath}, {"db1", "uname"})) {
       std::string text;
       for (TRecordProperty const& property : record.GetProperties())
         if (property.fName.find("System") == property.fName.npos && property.fName != "CreationClassName")
@@ -89,7 +89,7 @@ TEST_F(ScsiRecordsTest, AMissingValueOfADeviceHasAReason) {
   fDevices.Add("0:0:0:0", "0", "        ", "M", "R");
   std::filesystem::remove(fPath + "/0:0:0:0/rev");
   EXPECT_THAT(Records(), ElementsAre("0:0:0:0|Direct Access Device|<the device reports only blanks>|M|<" + fPath +
-                                     "/0:0:0:0/rev cannot be read>"));
+                                     "/0:0:0:0/rev does not exist>"));
 }
 
 TEST_F(ScsiRecordsTest, ADeviceThatIsRemovedMeanwhileIsOmitted) {
@@ -105,11 +105,11 @@ TEST_F(ScsiRecordsTest, WithoutTheDirectoryThereAreNoDevices) {
 
 TEST_F(ScsiRecordsTest, TheEnvironmentMayNameAnotherDirectory) {
   TEnvironmentGuard const named("ZEP_SCSI_DEVICES", fPath.c_str());
-  EXPECT_EQ(ScsiDirectory(TMachineFiles("/")), fPath);
+  EXPECT_EQ(ScsiDirectory(TMachineFiles("/")).fPath, fPath);
   TEnvironmentGuard const empty("ZEP_SCSI_DEVICES", "");
-  EXPECT_EQ(ScsiDirectory(TMachineFiles("/")), "/sys/bus/scsi/devices");
+  EXPECT_EQ(ScsiDirectory(TMachineFiles("/")).fPath, "/sys/bus/scsi/devices");
   TEnvironmentGuard const unset("ZEP_SCSI_DEVICES", nullptr);
-  EXPECT_EQ(ScsiDirectory(TMachineFiles("/")), "/sys/bus/scsi/devices");
+  EXPECT_EQ(ScsiDirectory(TMachineFiles("/")).fPath, "/sys/bus/scsi/devices");
 }
 
 }  // namespace

@@ -39,6 +39,7 @@ TRun AddMofArguments(CLI::App& command);         // MofCommand.cpp
 TRun AddPluginArguments(CLI::App& command);      // PluginCommand.cpp
 TRun AddPluginsArguments(CLI::App& command);     // PluginsCommand.cpp
 TRun AddProxyCheckArguments(CLI::App& command);  // ProxyCheckCommand.cpp
+TRun AddRecordArguments(CLI::App& command);      // RecordCommand.cpp
 TRun AddRemoteArguments(CLI::App& command);      // RemoteCommand.cpp
 TRun AddReportArguments(CLI::App& command);      // ReportCommand.cpp
 TRun AddRunArguments(CLI::App& command);         // RunCommand.cpp

@@ -5,6 +5,7 @@
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/TPlugInProgress.h"
 #include "tools/zep/output/Text.h"
+#include "tools/zep/processes/Interrupts.h"
 #include "tools/zep/processes/SharePath.h"
 
 #include <CLI/CLI.hpp>
@@ -33,7 +34,10 @@ std::vector<TPlugIn> LoadApart(std::vector<TPlugInFile> const& files, std::optio
   options.fLimits.fTimeoutSeconds = arguments.fTimeoutSeconds;
   options.fLimits.fMemoryMebibytes = arguments.fMemoryMebibytes;
   options.fMeasures = measures;
-  options.fShowProgress = [&progress](std::vector<TPlugInAtWork> const& atWork) { progress.Show(atWork); };
+  options.fShowProgress = [&progress](std::vector<TPlugInAtWork> const& atWork) {
+    progress.Show(atWork);
+    ThrowIfInterrupted();
+  };
   return LoadPlugInsApart(files, sample, options);
 }
 

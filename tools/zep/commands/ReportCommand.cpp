@@ -22,6 +22,7 @@
 #include "tools/zep/output/ReportText.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/processes/Interrupts.h"
+#include "tools/zep/recording/TReplay.h"
 #include "tools/zep/transfer/ReportFileName.h"
 #include "tools/zep/transfer/SendReport.h"
 
@@ -52,6 +53,7 @@ struct TArguments {
   std::string fFailOn;        // a severity; empty for none
   std::string fFrom;          // a stored report; empty for this machine
   std::string fSince;         // a stored report to compare with; empty for none
+  std::string fReplay;        // a recording; empty for this machine
   std::string fHtmlFile;      // the page to write; empty for none
   std::string fMedium;        // the device to write to; empty for standard output
 };
@@ -174,7 +176,7 @@ EExitStatus Send(TMadeReport const& made, TTarget const& target, TArguments cons
 int Deliver(TMadeReport const& made, TTarget const& target, TArguments const& arguments, std::optional<TInterruptGuard>& guard) {
   TReport const& report = made.Report();
   EExitStatus status = ExitStatusOf(report.fCompleteness);
-  if (!arguments.fMedium.empty()) guard.emplace();
+  if (!arguments.fMedium.empty() && !guard) guard.emplace();
   auto const pageFailure = WritePage(made, arguments);
   TReportDocument document = PrintOrWrite(made, arguments);
   if (!arguments.fTarget.empty()) {
@@ -209,27 +211,42 @@ int ReportFrom(TArguments const& arguments) {
   return StatusOf(report);
 }
 
+TReport ReportHere(std::optional<TSample> const& sample, TArguments const& arguments) {
+  return MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample, {ThresholdSettings()});
+}
+
 // Both reports are redacted with the same map, so that they differ only where their originals do.
 int ReportSince(TArguments const& arguments) {
   TStoredReport const before = ReadReport(arguments.fSince, arguments.fRedaction);
   auto const sample = SampleIf(arguments.fSample);
-  TReport report = MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample, {ThresholdSettings()});
-  TStoredReport const now = TMadeReport(std::move(report), arguments.fRedaction).Stored();
+  TStoredReport const now = TMadeReport(ReportHere(sample, arguments), arguments.fRedaction).Stored();
   return PrintDifferences("zep report --since", before, now, {arguments.fAsJson, arguments.fHtmlFile});
+}
+
+// The report on the machine that `replay` makes the plug-ins read.
+TReport ReportOn(TReplay const& replay, TArguments const& arguments) {
+  auto const files = replay.Choose(FindPlugInsFor(arguments.fPlugIns));
+  TReport report = MakeReport(LoadPlugInsFor(arguments.fPlugIns, std::nullopt, files), std::nullopt, {ThresholdSettings()});
+  report.fRecorded = replay.Index().fTime;
+  return report;
 }
 
 // Prints the message of an interrupted run itself: the signal ends zep when `guard` ends.
 int Report(TArguments const& arguments) {
   std::optional<TSample> sample;
   std::optional<TInterruptGuard> guard;
+  std::optional<TReplay> replay;  // ends before the guard, because the signal then ends zep
   try {
     if (arguments.fFormat == kJsonLines && !arguments.fMedium.empty())
       throw TWrongUsage("--format jsonl and --to-media exclude each other");
     TTarget const target = arguments.fTarget.empty() ? TTarget{} : TargetOf(arguments.fTarget, arguments.fBySftp);
     if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
+    if (!arguments.fReplay.empty()) {
+      guard.emplace();
+      replay.emplace(arguments.fReplay);
+    }
     sample = SampleIf(arguments.fSample);
-    TReportRules const rules = {ThresholdSettings()};
-    TReport report = MakeReport(LoadPlugInsFor(arguments.fPlugIns, sample), sample, rules);
+    TReport report = replay ? ReportOn(*replay, arguments) : ReportHere(sample, arguments);
     return Deliver(TMadeReport(std::move(report), arguments.fRedaction), target, arguments, guard);
   } catch (std::exception const& failure) {
     bool const isOfMedium = !arguments.fMedium.empty() && arguments.fAsJson && !HasWrittenOutput();
@@ -252,6 +269,13 @@ void AddStoredOptions(CLI::App& command, TArguments& arguments) {
     since->excludes(command.get_option(other));
   }
   for (char const* other : {"--sample", "--plugin"}) from->excludes(command.get_option(other));
+  command
+      .add_option("--replay", arguments.fReplay,
+                  "Report on the machine of this recording, the output of zep record, instead of this machine")
+      ->type_name("FILE")
+      ->excludes(from)
+      ->excludes(since)
+      ->excludes(command.get_option("--sample"));
   for (char const* other : {"--to-media", "--section", "--full"})
     command.get_option("--html")->excludes(command.get_option(other));
 }
@@ -307,8 +331,8 @@ TRun AddReportArguments(CLI::App& command) {
       "Exit status: 0 when the identity is complete, even if details are missing, 2 when part of the identity is missing or\n"
       "a plug-in failed, 3 when a finding is as severe as --fail-on says or worse, 1 when none of it is known or the medium\n"
       "could not be mounted, written or unmounted, 64 for wrong usage; when the report could not be sent, the exit status\n"
-      "of zep send. With --from it is that of the stored report, with --since that of zep diff; 66 when the stored report is\n"
-      "refused, 73 when the page cannot be written.");
+      "of zep send. With --from it is that of the stored report, with --since that of zep diff; 66 when the stored report\n"
+      "or the recording is refused, 73 when the page cannot be written.");
   return [arguments] {
     if (!arguments->fFrom.empty()) return ReportFrom(*arguments);
     return arguments->fSince.empty() ? Report(*arguments) : ReportSince(*arguments);

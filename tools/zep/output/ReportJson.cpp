@@ -120,7 +120,7 @@ TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fM
   EExitStatus const status = ExitStatusOf(report.fCompleteness);
   fMembers = DocumentHead("zep report", status, WhyNotComplete(report), SampleLabelOf(report));
   fMembers["status"] = NameOf(status);
-  fMembers["time"] = Now();
+  fMembers["time"] = report.fRecorded.empty() ? Now() : report.fRecorded;
   fMembers["head"] = HeadLines(report);
   fMembers["smbiosTableFile"] = OrNull(report.fTableFile);
   fMembers["findings"] = FindingsAsJson(report.fFindings);

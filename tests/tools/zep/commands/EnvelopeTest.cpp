@@ -110,6 +110,8 @@ TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
       {"zep report", 64, {"report", "--format", "json", "--since", "there"}},
       {"zep report", 66, {"report", "--json", "--since", "there"}},
       {"zep report", 64, {"report", "--json", "--from", "a.json"}},
+      {"zep report", 66, {"report", "--json", "--replay", "there"}},
+      {"zep record", 73, {"record", "--json", "/nowhere/recording"}},
       {"zep report", 64, {"report", "--json", "--sample", "--redact", "names"}},
       {"zep report", 73, {"report", "--json", "--sample", "--redact", "--redaction-map", "/nowhere/map"}},
       {"zep unredact", 66, {"unredact", "--json", "there", "--map", "there"}},
@@ -173,6 +175,7 @@ TEST_F(EnvelopeTest, EveryCommandThatSucceedsPrintsADocumentWithItsExitStatus) {
   Write("redacted.json", Run({"report", "--sample", "--json", "--redact", "--redaction-map", "map"}).fOutput);
   TRow const rows[] = {
       {"zep report", 0, {"report", "--json", "--sample"}},
+      {"zep record", 0, {"record", "--json", "recording"}},
       {"zep report", 0, {"report", "--json", "--sample", "--redact", "--redaction-map", "map"}},
       {"zep report", 0, {"unredact", "--json", "redacted.json", "--map", "map"}},
       {"zep diff", 0, {"diff", "--json", "a.json", "a.json"}},

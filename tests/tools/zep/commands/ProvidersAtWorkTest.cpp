@@ -160,6 +160,27 @@ TEST_F(ProvidersAtWorkTest, AnInterruptLeavesNoProcess) {
   ExpectNoProcess("Hangs");
 }
 
+TEST_F(ProvidersAtWorkTest, AnInterruptedRecordingLeavesNoFiles) {
+  Add({"Hangs"});
+  TTempDir const temporary;
+  std::string const file = fZep.Path("here.rec");
+  pid_t const zep = ::fork();
+  if (zep == 0) {
+    ::setenv("ZEP_MISDEEDS", fZep.Path("").c_str(), 1);
+    ::setenv("TMPDIR", temporary.Path().c_str(), 1);
+    ::execl(fZep.Path("bin/zep").c_str(), "zep", "record", file.c_str(), nullptr);
+    ::_exit(127);
+  }
+  WaitFor("Hangs");
+  ::kill(zep, SIGINT);
+  int status = 0;
+  ::waitpid(zep, &status, 0);
+  EXPECT_TRUE(WIFSIGNALED(status) && WTERMSIG(status) == SIGINT);
+  ExpectNoProcess("Hangs");
+  EXPECT_TRUE(fs::is_empty(temporary.Path()));
+  EXPECT_FALSE(fs::exists(file));
+}
+
 TEST_F(ProvidersAtWorkTest, APlugInThatKillsZepLeavesNoProcess) {
   Add({"KillsItsOwner"});
   int status = 0;

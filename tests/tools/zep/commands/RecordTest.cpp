@@ -1,0 +1,70 @@
+// SPDX-License-Identifier: Apache-2.0
+
+// zep record and zep report --replay. tests/system/machines compares the reports.
+
+#include "tests/tools/zep/Zep.h"
+
+#include <gmock/gmock.h>
+
+namespace NQRVZEP20::zep {
+namespace {
+
+using testing::HasSubstr;
+using testing::IsEmpty;
+using testing::StartsWith;
+
+class RecordTest : public testing::Test {
+protected:
+  TRun Run(std::vector<std::string> const& arguments, std::map<std::string, std::string> environment = {}) {
+    environment["TMPDIR"] = fTemporary.Path();
+    TCall call = {arguments, environment};
+    call.fDirectory = fZep.Path("");
+    return fZep.Run(call);
+  }
+
+  std::size_t TemporaryFiles() const {
+    return static_cast<std::size_t>(std::distance(fs::directory_iterator(fTemporary.Path()), fs::directory_iterator()));
+  }
+
+  TInstallation fZep;
+  TTempDir fTemporary;
+};
+
+TEST_F(RecordTest, ARecordingIsForItsOwnerAndReadableWithTar) {
+  TRun const run = Run({"record", "here.rec"});
+  EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+  EXPECT_THAT(run.fOutput, StartsWith("The recording here.rec has "));
+  EXPECT_EQ(fs::status(fZep.Path("here.rec")).permissions(), fs::perms::owner_read | fs::perms::owner_write);
+  std::string const list = "tar --zstd -tf '" + fZep.Path("here.rec") + "' root/proc/meminfo > '" + fZep.Path("list") + "' 2>&1";
+  EXPECT_EQ(std::system(list.c_str()), 0);
+  EXPECT_EQ(ReadFile(fZep.Path("list")), "root/proc/meminfo\n");  // and no warning
+  EXPECT_EQ(TemporaryFiles(), 0u);
+}
+
+TEST_F(RecordTest, ARefusedRecordingIsNamedAndNothingOfItRemains) {
+  WriteFile(fZep.Path("bad.rec"), "hello");
+  TRun const run = Run({"report", "--replay", "bad.rec"});
+  EXPECT_EQ(run.fStatus, 66);
+  EXPECT_THAT(run.fErrors, StartsWith("zep: bad.rec is refused: it is cut, damaged or not a zstd-compressed tar archive"));
+  EXPECT_THAT(run.fOutput, IsEmpty());
+  EXPECT_EQ(Run({"report", "--replay", "none.rec"}).fErrors, "zep: none.rec cannot be read: it is not a file\n");
+  EXPECT_EQ(TemporaryFiles(), 0u);
+}
+
+TEST_F(RecordTest, ARecordingIsOfOneMachine) {
+  TRun const run = Run({"record", "here.rec"}, {{"ZEP_SMBIOS_TABLE", SamplePath()}, {"ZEP_HOST_NAME", "other-host"}});
+  EXPECT_EQ(run.fStatus, 0) << run.fErrors;
+  EXPECT_THAT(Run({"report", "--replay", "here.rec"}).fOutput, testing::Not(HasSubstr("other-host")));
+}
+
+TEST_F(RecordTest, APlugInThatCannotBeRecordedIsNamedAndNotReplayed) {
+  fZep.Add("libClock.nsp.so", CLOCK_PLUGIN);
+  TRun const run = Run({"record", "here.rec"});
+  EXPECT_EQ(run.fStatus, 2);
+  EXPECT_THAT(run.fOutput, HasSubstr("Not recorded: libClock.nsp.so: it does not read through TMachineFiles of zepcore"));
+  TRun const replay = Run({"report", "--replay", "here.rec"});
+  EXPECT_EQ(replay.fErrors, "zep: here.rec has nothing of libClock.nsp.so, which is therefore not loaded\n");
+}
+
+}  // namespace
+}  // namespace NQRVZEP20::zep

@@ -1,0 +1,113 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/zep/recording/Archive.h"
+
+#include "collect/SafeText.h"
+
+#include <archive_entry.h>
+
+#include <new>
+#include <utility>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+constexpr std::size_t kBlock = 65536;
+
+mode_t TypeOf(EMemberKind kind) {
+  return kind == EMemberKind::kFile ? AE_IFREG : kind == EMemberKind::kDirectory ? AE_IFDIR : AE_IFLNK;
+}
+
+EMemberKind KindOf(archive_entry* entry) {
+  bool const isHardLink = archive_entry_hardlink(entry) != nullptr;
+  mode_t const type = archive_entry_filetype(entry);
+  if (!isHardLink && type == AE_IFREG) return EMemberKind::kFile;
+  if (!isHardLink && type == AE_IFDIR) return EMemberKind::kDirectory;
+  if (!isHardLink && type == AE_IFLNK) return EMemberKind::kLink;
+  throw TArchiveError("it contains something else than files, directories and symbolic links");
+}
+
+std::string TextOf(char const* text) { return text != nullptr ? text : ""; }
+
+std::string WithoutEndSlash(std::string name) {
+  while (name.size() > 1 && name.back() == '/') name.pop_back();
+  return name;
+}
+
+la_ssize_t Append(archive*, void* bytes, void const* buffer, std::size_t length) {
+  static_cast<std::string*>(bytes)->append(static_cast<char const*>(buffer), length);
+  return static_cast<la_ssize_t>(length);
+}
+
+void Check(archive* of, bool isGood) {
+  if (!isGood) throw std::runtime_error("libarchive: " + TextOf(archive_error_string(of)));
+}
+
+}  // namespace
+
+TArchiveWriter::TArchiveWriter() : fArchive(archive_write_new(), archive_write_free) {
+  if (!fArchive) throw std::bad_alloc();
+  archive* const of = fArchive.get();
+  // A pax archive could only have names in the character set of the locale; zep runs in the locale "C".
+  Check(of, archive_write_set_format_gnutar(of) == ARCHIVE_OK && archive_write_add_filter_zstd(of) == ARCHIVE_OK &&
+                archive_write_set_bytes_in_last_block(of, 1) == ARCHIVE_OK &&
+                archive_write_open(of, &fBytes, nullptr, Append, nullptr) == ARCHIVE_OK);
+}
+
+void TArchiveWriter::Add(TMember const& member, std::string const& content) {
+  std::unique_ptr<archive_entry, void (*)(archive_entry*)> const entry(archive_entry_new(), archive_entry_free);
+  archive_entry_set_pathname(entry.get(), member.fName.c_str());
+  archive_entry_set_filetype(entry.get(), TypeOf(member.fKind));
+  archive_entry_set_perm(entry.get(), member.fMode);
+  archive_entry_set_mtime(entry.get(), member.fTime.tv_sec, member.fTime.tv_nsec);
+  archive_entry_set_size(entry.get(), static_cast<la_int64_t>(content.size()));
+  if (member.fKind == EMemberKind::kLink) archive_entry_set_symlink(entry.get(), member.fTarget.c_str());
+  Check(fArchive.get(), archive_write_header(fArchive.get(), entry.get()) == ARCHIVE_OK);
+  auto const written = archive_write_data(fArchive.get(), content.data(), content.size());
+  Check(fArchive.get(), written == static_cast<la_ssize_t>(content.size()));
+}
+
+std::string TArchiveWriter::Finish() {
+  Check(fArchive.get(), archive_write_close(fArchive.get()) == ARCHIVE_OK);
+  return std::move(fBytes);
+}
+
+TArchiveReader::TArchiveReader(std::string const& file) : fArchive(archive_read_new(), archive_read_free) {
+  if (!fArchive) throw std::bad_alloc();
+  archive* const of = fArchive.get();
+  archive_read_support_filter_zstd(of);
+  archive_read_support_format_tar(of);
+  if (archive_read_open_filename(of, file.c_str(), kBlock) != ARCHIVE_OK) Throw("");
+}
+
+std::optional<TMember> TArchiveReader::Next() {
+  archive_entry* entry = nullptr;
+  int const status = archive_read_next_header(fArchive.get(), &entry);
+  if (status == ARCHIVE_EOF) return std::nullopt;
+  if (status != ARCHIVE_OK) Throw(fName.empty() ? "" : " after its member " + Printable(fName));
+  fName = WithoutEndSlash(TextOf(archive_entry_pathname(entry)));
+  EMemberKind const kind = KindOf(entry);
+  if (kind != EMemberKind::kFile && archive_entry_size(entry) != 0)
+    throw TArchiveError("its member " + Printable(fName) + " has a content, but is not a file");
+  return TMember{kind, fName, TextOf(archive_entry_symlink(entry)), archive_entry_perm(entry), {}};
+}
+
+std::string TArchiveReader::Content(std::uint64_t limit) {
+  std::string content;
+  char buffer[kBlock];
+  for (;;) {
+    la_ssize_t const count = archive_read_data(fArchive.get(), buffer, sizeof buffer);
+    if (count == 0) return content;
+    if (count < 0) Throw(" in its member " + Printable(fName));
+    content.append(buffer, static_cast<std::size_t>(count));
+    if (content.size() > limit)
+      throw TArchiveError("its member " + Printable(fName) + " is longer than " + std::to_string(limit) + " bytes");
+  }
+}
+
+void TArchiveReader::Throw(std::string const& where) const {
+  throw TArchiveError("it is cut, damaged or not a zstd-compressed tar archive" + where + ": " +
+                      TextOf(archive_error_string(fArchive.get())));
+}
+
+}  // namespace NQRVZEP20::zep

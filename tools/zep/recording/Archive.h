@@ -1,0 +1,69 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <archive.h>
+
+#include <sys/types.h>
+#include <cstdint>
+#include <ctime>
+#include <memory>
+#include <optional>
+#include <stdexcept>
+#include <string>
+
+struct archive_entry;
+
+namespace NQRVZEP20::zep {
+
+// zstd-compressed tar archives of files, directories and symbolic links, by libarchive.
+
+enum class EMemberKind { kFile, kDirectory, kLink };
+
+struct TMember {
+  EMemberKind fKind;
+  std::string fName;         // a relative path
+  std::string fTarget = {};  // of a link
+  mode_t fMode = 0;          // the permissions
+  std::timespec fTime = {};
+};
+
+// Compresses an archive into memory. Every operation throws std::runtime_error if libarchive fails.
+class TArchiveWriter {
+public:
+  TArchiveWriter();
+
+  void Add(TMember const& member, std::string const& content = "");
+
+  // The complete archive. Call it once, at the end.
+  std::string Finish();
+
+private:
+  std::unique_ptr<archive, int (*)(archive*)> fArchive;
+  std::string fBytes;
+};
+
+// Why an archive is refused: a clause that names the member.
+struct TArchiveError : std::runtime_error {
+  using std::runtime_error::runtime_error;
+};
+
+// Reads an archive from first to last. It is foreign input: names are not checked, but nothing is written anywhere, and no more
+// memory is used than the caller allows. Every operation throws TArchiveError.
+class TArchiveReader {
+public:
+  explicit TArchiveReader(std::string const& file);
+
+  // The next member; none at the end. A member of another kind, such as a device or a hard link, is an error.
+  std::optional<TMember> Next();
+
+  // The content of the current member, which is an error if it is longer than `limit` bytes.
+  std::string Content(std::uint64_t limit);
+
+private:
+  [[noreturn]] void Throw(std::string const& where) const;
+
+  std::unique_ptr<archive, int (*)(archive*)> fArchive;
+  std::string fName;  // of the current member
+};
+
+}  // namespace NQRVZEP20::zep

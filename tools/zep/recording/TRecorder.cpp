@@ -1,0 +1,128 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "tools/zep/recording/TRecorder.h"
+
+#include "providers/reasons/RecordedMark.h"
+#include "tools/zep/output/Failure.h"
+#include "tools/zep/processes/Interrupts.h"
+#include "tools/zep/transfer/Sha256.h"
+
+#include <sys/stat.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <ctime>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+
+namespace NQRVZEP20::zep {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+std::string ValueOf(char const* variable) {
+  char const* const value = std::getenv(variable);
+  return value != nullptr ? value : "";
+}
+
+// The root of the machine, before another root is set.
+std::string MachineRoot() {
+  std::string const root = ValueOf("ZEP_ROOT");
+  return root.empty() ? "/" : fs::absolute(root).string();
+}
+
+std::string MadeDirectory(std::string const& path) {
+  fs::create_directory(path);
+  return path;
+}
+
+std::string ContentOf(std::string const& path) {
+  std::ifstream file(path, std::ios::binary);
+  return {std::istreambuf_iterator<char>(file), {}};
+}
+
+TRecordedMember MemberOf(fs::path const& path, std::string const& name) {
+  struct stat status {};
+  if (::lstat(path.c_str(), &status) != 0)
+    throw fs::filesystem_error("a recorded file", path, std::error_code(errno, std::generic_category()));
+  TMember member{EMemberKind::kFile, name, {}, status.st_mode & 07777, status.st_mtim};
+  if (S_ISDIR(status.st_mode)) member.fKind = EMemberKind::kDirectory;
+  if (S_ISLNK(status.st_mode)) {
+    member.fKind = EMemberKind::kLink;
+    member.fTarget = fs::read_symlink(path).string();
+  }
+  TRecordedMember recorded{std::move(member)};
+  if (recorded.fMember.fKind != EMemberKind::kFile) return recorded;
+  recorded.fTime = TimeText(status.st_mtim.tv_sec);
+  recorded.fBytes = static_cast<std::uint64_t>(status.st_size);
+  recorded.fSha256 = Sha256Of(path);
+  if (IsMark(status)) recorded.fMark = ContentOf(path);
+  return recorded;
+}
+
+// All members in the order of their names, so that a directory comes before its files.
+std::vector<TRecordedMember> MembersBelow(fs::path const& root) {
+  std::vector<TRecordedMember> members{MemberOf(root, kRecordedRoot)};
+  for (fs::directory_entry const& entry : fs::recursive_directory_iterator(root)) {
+    ThrowIfInterrupted();
+    members.push_back(MemberOf(entry.path(), kRecordedRoot + ("/" + entry.path().lexically_relative(root).string())));
+  }
+  std::sort(members.begin(), members.end(),
+            [](auto const& one, auto const& other) { return one.fMember.fName < other.fMember.fName; });
+  return members;
+}
+
+// A plug-in that reads through TMachineFiles leaves an empty file of its name.
+void NamePlugIns(TRecordingIndex& index, fs::path const& root, std::vector<TPlugIn> const& plugIns) {
+  for (TPlugIn const& plugIn : plugIns) {
+    std::string const name = fs::path(plugIn.fFile).filename().string();
+    if (fs::exists(root / "zep-plug-ins" / name))
+      index.fPlugIns.push_back(name);
+    else
+      index.fNotRecorded.push_back({name, plugIn.fError.empty()
+                                              ? "it does not read through TMachineFiles of zepcore, so its reading cannot "
+                                                "be recorded"
+                                              : plugIn.fError});
+  }
+}
+
+void CheckSize(TRecordingIndex const& index) {
+  std::uint64_t bytes = 0;
+  for (TRecordedMember const& member : index.fMembers) bytes += member.fBytes;
+  if (bytes > kMostRecordedBytes || index.fMembers.size() > kMostRecordedMembers)
+    throw TFailure(kExitNothing, "the plug-ins read more than a recording may contain: " + std::to_string(bytes) + " bytes in " +
+                                     std::to_string(index.fMembers.size()) + " files; the limits are " +
+                                     std::to_string(kMostRecordedBytes) + " and " + std::to_string(kMostRecordedMembers));
+}
+
+}  // namespace
+
+TRecorder::TRecorder()
+    : fDirectory("zep-recording"),
+      fVariables({{"ZEP_RECORD_FROM", MachineRoot()},
+                  {"ZEP_ROOT", MadeDirectory(fDirectory.Path(kRecordedRoot))},
+                  {"ZEP_SMBIOS_TABLE", ""},
+                  {"ZEP_HOST_NAME", ""},
+                  {"ZEP_SCSI_DEVICES", ""}}) {}
+
+TRecorder::TResult TRecorder::Finish(std::vector<TPlugIn> const& plugIns) const {
+  fs::path const root = fDirectory.Path(kRecordedRoot);
+  TResult result;
+  TRecordingIndex& index = result.fIndex;
+  index.fTime = TimeText(std::time(nullptr));
+  index.fTool = ZEP_VERSION;
+  NamePlugIns(index, root, plugIns);
+  index.fMembers = MembersBelow(root);
+  CheckSize(index);
+  TArchiveWriter archive;
+  archive.Add({EMemberKind::kFile, kIndexName, {}, 0600, {std::time(nullptr), 0}}, TextOf(index));
+  for (TRecordedMember const& recorded : index.fMembers) {
+    TMember const& member = recorded.fMember;
+    archive.Add(member, member.fKind == EMemberKind::kFile ? ContentOf(fDirectory.Path(member.fName)) : "");
+  }
+  result.fArchive = archive.Finish();
+  return result;
+}
+
+}  // namespace NQRVZEP20::zep

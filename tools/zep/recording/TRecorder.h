@@ -1,0 +1,32 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "collect/PlugIns.h"
+#include "tools/zep/processes/TScratchDirectory.h"
+#include "tools/zep/recording/RecordingIndex.h"
+#include "tools/zep/recording/TProviderVariables.h"
+
+#include <string>
+#include <vector>
+
+namespace NQRVZEP20::zep {
+
+// While an object exists, plug-ins that are loaded record what they read of the machine, which is this one or that below
+// ZEP_ROOT. Variables that make them read something else, such as ZEP_SMBIOS_TABLE, have no effect meanwhile.
+class TRecorder {
+public:
+  TRecorder();
+
+  // What was recorded of these plug-ins, as an index without checksums and a file of it.
+  struct TResult {
+    TRecordingIndex fIndex;
+    std::string fArchive;
+  };
+  TResult Finish(std::vector<TPlugIn> const& plugIns) const;
+
+private:
+  TScratchDirectory fDirectory;
+  TProviderVariables fVariables;
+};
+
+}  // namespace NQRVZEP20::zep
