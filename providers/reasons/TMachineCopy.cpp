@@ -6,6 +6,7 @@
 #include <dlfcn.h>
 #include <fcntl.h>
 #include <sys/file.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -25,11 +26,6 @@ constexpr mode_t kWholeMode = 0400, kPartMode = 0600;
 
 // The link of a process to its own directory: each process that reads has another one, so it is copied as a directory.
 constexpr char const* kOwnProcess = "/proc/self";
-
-void MakeDirectory(std::string const& path) {
-  std::error_code ignored;
-  fs::create_directories(path, ignored);
-}
 
 std::string FileOf(void const* address) {
   Dl_info info = {};
@@ -71,10 +67,12 @@ private:
 
 }  // namespace
 
-TMachineCopy::TMachineCopy(std::string from, std::string to) : fFrom(std::move(from)), fTo(std::move(to)) {
-  std::string const library = fs::path(FileOf(&kOwnProcess)).filename().string();
-  Write("/zep-plug-ins/" + library, "", kWholeMode);
+TMachineCopy::TMachineCopy(std::string from, std::string to)
+    : fFrom(std::move(from)), fTo(std::move(to)), fNote("/zep-plug-ins/" + fs::path(FileOf(&kOwnProcess)).filename().string()) {
+  if (!OpenBelow("", fTo + fNote, O_PATH)) Write(fNote, "", kWholeMode);
 }
+
+void TMachineCopy::NoteLoss() const { ::chmod((fTo + fNote).c_str(), kPartMode); }
 
 TMachineCopy::TPlace TMachineCopy::Look(std::string const& path) const {
   TFd const file = OpenBelow(fFrom, path.empty() ? "/" : path, O_PATH | O_NOFOLLOW);
@@ -115,31 +113,40 @@ TMachineCopy::TPlace TMachineCopy::Walk(std::string const& path) const {
 
 void TMachineCopy::Keep(TPlace const& place) const {
   if (S_ISDIR(place.fStatus.st_mode) || place.fPath == kOwnProcess)
-    MakeDirectory(fTo + place.fPath);
+    KeepDirectory(place.fPath);
   else if (!OpenBelow("", fTo + place.fPath, O_PATH | O_NOFOLLOW))
     Mark(place.fPath, S_ISREG(place.fStatus.st_mode) ? kListedMark : kSpecialMark);
 }
 
+void TMachineCopy::KeepDirectory(std::string const& path) const {
+  std::error_code failure;
+  fs::create_directories(fTo + path, failure);
+  if (failure) NoteLoss();
+}
+
 void TMachineCopy::KeepLink(std::string const& path, std::string const& target) const {
-  MakeDirectory(fs::path(fTo + path).parent_path());
-  [[maybe_unused]] int const made = ::symlink(RelativeTarget(path, target).c_str(), (fTo + path).c_str());  // or it exists
+  KeepDirectory(fs::path(path).parent_path());
+  if (::symlink(RelativeTarget(path, target).c_str(), (fTo + path).c_str()) != 0 && errno != EEXIST) NoteLoss();
 }
 
 // Writes a file anew.
 void TMachineCopy::Write(std::string const& path, std::string const& content, mode_t mode) const {
   std::string const file = fTo + path;
-  MakeDirectory(fs::path(file).parent_path());
+  KeepDirectory(fs::path(path).parent_path());
   ::unlink(file.c_str());
   TFd const made(::open(file.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, kPartMode));
   bool const isWritten = made && ::write(made.Get(), content.data(), content.size()) == static_cast<ssize_t>(content.size());
-  if (!isWritten || ::fchmod(made.Get(), mode) != 0) ::unlink(file.c_str());
+  if (isWritten && ::fchmod(made.Get(), mode) == 0) return;
+  ::unlink(file.c_str());
+  NoteLoss();
 }
 
 // Writes a part of a file, and leaves those that it has.
 void TMachineCopy::WritePart(std::string const& path, std::size_t offset, std::string const& content) const {
   if (IsMark(StatusOf(OpenBelow("", fTo + path, O_PATH)))) Write(path, "", kPartMode);
   TFd const part(::open((fTo + path).c_str(), O_WRONLY | O_CLOEXEC));
-  [[maybe_unused]] ssize_t const written = ::pwrite(part.Get(), content.data(), content.size(), static_cast<off_t>(offset));
+  ssize_t const written = ::pwrite(part.Get(), content.data(), content.size(), static_cast<off_t>(offset));
+  if (written != static_cast<ssize_t>(content.size())) NoteLoss();
 }
 
 // Whether the file was copied to its end.

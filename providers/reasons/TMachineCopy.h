@@ -16,12 +16,13 @@ namespace NQRVZEP20 {
 // directories on the way to each file, and marks (RecordedMark.h) in place of files that cannot be read or were only listed.
 //
 // Paths are those on the machine. Several processes may fill the same copy: the first one that reads a file to its end decides
-// its content. Failures to write are not reported: what is not in the copy cannot be read from it either. Operations block as
-// long as the file systems do, and while another process copies.
+// its content. A failure to write makes the note of the library writable: what is not in the copy cannot be read from it either,
+// so the library has not read all that it could. Operations block as long as the file systems do, and while another process
+// copies.
 class TMachineCopy {
 public:
   // `from`: the root of the machine, empty for "/". `to`: the root of the copy, an existing directory. Notes the library that
-  // this code is part of in /zep-plug-ins/, so that a recording names the plug-ins that read through it.
+  // this code is part of as an empty file in /zep-plug-ins/, so that a recording names the plug-ins that read through it.
   TMachineCopy(std::string from, std::string to);
 
   // Copies the `length` bytes from `offset`, or the refusal.
@@ -47,14 +48,17 @@ private:
   TPlace Walk(std::string const& path) const;
   TPlace Look(std::string const& path) const;
   void Keep(TPlace const& place) const;
+  void KeepDirectory(std::string const& path) const;
   void KeepLink(std::string const& path, std::string const& target) const;
   void Write(std::string const& path, std::string const& content, mode_t mode) const;
   void WritePart(std::string const& path, std::size_t offset, std::string const& content) const;
   bool HasWhole(std::string const& path) const;
   void Mark(std::string const& path, std::string const& mark) const;
+  void NoteLoss() const;
 
   std::string fFrom;
   std::string fTo;
+  std::string fNote;  // the file in /zep-plug-ins/
 };
 
 }  // namespace NQRVZEP20

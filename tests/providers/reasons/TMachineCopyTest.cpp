@@ -5,7 +5,10 @@
 #include "tests/Support.h"
 
 #include <gmock/gmock.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
+
+#include <csignal>
 
 namespace NQRVZEP20 {
 namespace {
@@ -124,6 +127,39 @@ TEST_F(TMachineCopyTest, TheDirectoryOfTheReadingProcessIsCopiedUnderOneName) {
 TEST_F(TMachineCopyTest, TheReadingLibraryIsNoted) {
   Recording();
   EXPECT_TRUE(fs::exists(fCopy.Path("zep-plug-ins/reasons_tests")));
+}
+
+// Not even files of a few bytes can be written while an object exists.
+class TFullDisk {
+public:
+  TFullDisk() {
+    ::getrlimit(RLIMIT_FSIZE, &fBefore);
+    rlimit const full = {3, fBefore.rlim_max};
+    ::setrlimit(RLIMIT_FSIZE, &full);
+  }
+  ~TFullDisk() {
+    ::setrlimit(RLIMIT_FSIZE, &fBefore);
+    std::signal(SIGXFSZ, fHandler);
+  }
+
+private:
+  rlimit fBefore = {};
+  void (*fHandler)(int) = std::signal(SIGXFSZ, SIG_IGN);
+};
+
+TEST_F(TMachineCopyTest, ALossIsNoted) {
+  fs::path const note = fCopy.Path("zep-plug-ins/reasons_tests");
+  auto const isWritable = [&] { return (fs::status(note).permissions() & fs::perms::owner_write) != fs::perms::none; };
+  TMachineFiles const files = Recording();
+  EXPECT_EQ(Text(files.Line("/sys/class/net/eth0/mtu")), "1500");
+  EXPECT_FALSE(isWritable());
+  {
+    TFullDisk const full;
+    EXPECT_EQ(Text(files.Content("/config")), "</config does not exist>");
+  }
+  EXPECT_TRUE(isWritable());
+  Recording();
+  EXPECT_TRUE(isWritable());
 }
 
 }  // namespace

@@ -73,17 +73,27 @@ std::vector<TRecordedMember> MembersBelow(fs::path const& root) {
   return members;
 }
 
-// A plug-in that reads through TMachineFiles leaves an empty file of its name.
+// A plug-in that reads through TMachineFiles leaves a note: an empty file of its name, which is writable if something that it
+// read is missing (TMachineCopy.h). Returns why the plug-in was not recorded, or an empty text.
+std::string WhyNotRecorded(TPlugIn const& plugIn, fs::path const& note) {
+  struct stat status {};
+  if (::stat(note.c_str(), &status) == 0)
+    return (status.st_mode & S_IWUSR) == 0
+               ? ""
+               : "what it reads could not be written to the temporary directory; free space in it, or "
+                 "name another directory in TMPDIR";
+  if (!plugIn.fError.empty()) return plugIn.fError;
+  return "it does not read through TMachineFiles of zepcore, so its reading cannot be recorded";
+}
+
 void NamePlugIns(TRecordingIndex& index, fs::path const& root, std::vector<TPlugIn> const& plugIns) {
   for (TPlugIn const& plugIn : plugIns) {
     std::string const name = fs::path(plugIn.fFile).filename().string();
-    if (fs::exists(root / "zep-plug-ins" / name))
+    std::string const why = WhyNotRecorded(plugIn, root / "zep-plug-ins" / name);
+    if (why.empty())
       index.fPlugIns.push_back(name);
     else
-      index.fNotRecorded.push_back({name, plugIn.fError.empty()
-                                              ? "it does not read through TMachineFiles of zepcore, so its reading cannot "
-                                                "be recorded"
-                                              : plugIn.fError});
+      index.fNotRecorded.push_back({name, why});
   }
 }
 
