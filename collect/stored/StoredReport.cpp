@@ -151,6 +151,7 @@ TStoredReport ReportOf(TStoredNode const& document) {
   if (auto const time = document.Optional("time")) report.fTime = time->Text();
   report.fStatus = document.TextOf("status");
   report.fReason = document.TextOrNullOf("reason");
+  if (auto const redaction = document.Optional("redaction")) report.fRedaction = redaction->Json().dump();
   report.fHead = document.Member("head").Elements([](TStoredNode const& line) { return line.Text(); });
   TStoredNode const findings = document.Member("findings");
   report.fProblems = findings.Member("problems").Elements(ProblemOf);

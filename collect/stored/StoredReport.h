@@ -66,12 +66,14 @@ struct TStoredProvider {
 
 // A document of `zep report --json` that was read back. A plain value.
 struct TStoredReport {
-  std::string fFile;    // its name
-  std::string fZep;     // the version of the program that wrote it
-  std::string fLabel;   // of the sample; empty without a sample
-  std::string fTime;    // "2026-11-23T04:05:06Z"; empty if the document does not have it
-  std::string fStatus;  // "complete", "partial" or "nothing"
-  std::string fReason;  // why it is not complete; otherwise empty
+  std::string fFile;       // its name
+  std::string fZep;        // the version of the program that wrote it
+  std::string fLabel;      // of the sample; empty without a sample
+  std::string fTime;       // "2026-11-23T04:05:06Z"; empty if the document does not have it
+  std::string fStatus;     // "complete", "partial" or "nothing"
+  std::string fReason;     // why it is not complete; otherwise empty
+  std::string fRedaction;  // the member "redaction" as JSON: the same pseudonym stands for the same secret in reports where it is
+                           // the same; empty if the report is not redacted
   std::vector<std::string> fHead;
   std::vector<TStoredProblem> fProblems;
   std::vector<TStoredRule> fRules;

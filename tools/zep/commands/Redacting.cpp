@@ -79,6 +79,8 @@ void RedactDocument(TJson& document, TRedactionArguments const& arguments) {
   TRedactionMap map(file);
   try {
     if (IsRedacted(document)) return CheckRedaction(RedactedWith(document), arguments.fKinds, map.Pseudonyms().Id(), file);
+    if (!document.contains("classes"))
+      throw TRedactionError("an older zep wrote it, without the superclasses of its classes, which decide what is a secret");
     Redact(document, arguments.fKinds, map.Pseudonyms());
   } catch (TRedactionError const& failure) {
     throw TFailure(kExitNoInput, "the report cannot be redacted: " + std::string(failure.what()));

@@ -89,15 +89,19 @@ std::optional<TFailure> WritePage(TMadeReport const& made, TReportArguments cons
   }
 }
 
-// Prints the number of secrets in the report, and asks on a terminal whether it is to be sent.
-bool IsSendingConfirmed(TReport const& report, TTarget const& target, TReportArguments const& arguments) {
+void PrintNumberOfSecrets(TReport const& report, TReportArguments const& arguments) {
   TReportDocument document(report, EMessages::kVerbatim);
   std::string const failure = FailureOf([&] {
     document.ReadInstances();
     std::string const contents = ContentsText(CountSecrets(std::move(document.Members())), arguments.fRedaction.fKinds);
-    if (!arguments.fOptions.fQuiet) std::cerr << "zep: the report contains " << contents << "\n";
+    std::cerr << "zep: the report contains " << contents << "\n";
   });
   if (!failure.empty()) std::cerr << "zep: the secrets in the report cannot be counted: " << Printable(failure) << "\n";
+}
+
+// Prints the number of secrets in the report, and asks on a terminal whether it is to be sent.
+bool IsSendingConfirmed(TReport const& report, TTarget const& target, TReportArguments const& arguments) {
+  if (!arguments.fOptions.fQuiet) PrintNumberOfSecrets(report, arguments);
   return arguments.fIsConfirmed || IsConfirmed("zep: send it to " + target.fRemote.fHost + "?");
 }
 

@@ -46,8 +46,25 @@ void PrintOrWritePage(TStoredReport const& report, std::string const& file) {
     WriteOutputFile(file, ReportAsHtml(report));
 }
 
+namespace {
+
+// Equal pseudonyms would stand for different secrets, and different ones for the same.
+void CheckPseudonyms(TStoredReport const& before, TStoredReport const& after) {
+  if (before.fRedaction == after.fRedaction) return;
+  bool const areBoth = !before.fRedaction.empty() && !after.fRedaction.empty();
+  std::string const& redacted = before.fRedaction.empty() ? after.fFile : before.fFile;
+  throw TFailure(kExitNoInput,
+                 before.fFile + " and " + after.fFile + " cannot be compared: " +
+                     (areBoth ? "they were redacted with different maps or kinds, so that their pseudonyms do not agree"
+                              : "only " + redacted + " is redacted") +
+                     "; redact both alike, or give the originals back with zep unredact");
+}
+
+}  // namespace
+
 EExitStatus PrintDifferences(std::string const& document, TStoredReport const& before, TStoredReport const& after,
                              TDifferenceOutput const& output) {
+  CheckPseudonyms(before, after);
   TDifferences const differences = DifferencesOf(before, after);
   EExitStatus const status = !differences.IsSame()              ? kExitNothing
                              : differences.fNotCompared.empty() ? kExitComplete

@@ -13,8 +13,9 @@ namespace NQRVZEP20::zep {
 // Reads a stored report (ReadStoredReport). Throws TFailure with kExitNoInput if it is refused.
 TStoredReport ReadReport(std::string const& file);
 
-// Reads the document of a stored report, and redacts it if that is wanted (RedactDocument). Throws in the same way.
-TJson ReadDocument(std::string const& file, TRedactionArguments const& redaction);
+// Reads the document of a stored report, whose parts are complete, and redacts it if that is wanted (RedactDocument). Throws in
+// the same way.
+TJson ReadDocument(std::string const& file, TRedactionArguments const& redaction = {});
 
 // The report of that document.
 TStoredReport ReadReport(std::string const& file, TRedactionArguments const& redaction);
@@ -32,7 +33,7 @@ struct TDifferenceOutput {
 
 // Prints the differences of two reports as text or as a document named `document`, or writes them as a page. Returns
 // kExitComplete if there are none, kExitNothing if there are some, and kExitPartial if there are none but not everything could be
-// compared.
+// compared. Throws TFailure with kExitNoInput if the reports are not redacted alike.
 EExitStatus PrintDifferences(std::string const& document, TStoredReport const& before, TStoredReport const& after,
                              TDifferenceOutput const& output);
 

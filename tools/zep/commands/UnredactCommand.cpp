@@ -3,8 +3,8 @@
 // zep unredact: the original of a redacted report.
 
 #include "collect/redaction/Redaction.h"
-#include "collect/stored/StoredDocument.h"
 #include "tools/zep/commands/Commands.h"
+#include "tools/zep/commands/StoredReports.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"
@@ -18,21 +18,12 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-// The document of a report whose parts are complete.
-TJson CheckedDocument(std::string const& file) {
-  TJson document = ReadStoredDocument(file);
-  StoredReportOf(document, file);
-  return document;
-}
-
 int Unredacted(std::string const& file, std::string const& map) {
   try {
-    TJson document = CheckedDocument(file);
+    TJson document = ReadDocument(file);
     Unredact(document, ReadRedactionMap(map.empty() ? UsualRedactionMap() : map));
     WriteOutput(AsVerbatimText(document));
     return kExitComplete;
-  } catch (TStoredReportError const& failure) {
-    throw TFailure(kExitNoInput, failure.what());
   } catch (TRedactionError const& failure) {
     throw TFailure(kExitNoInput, file + ": " + failure.what());
   }

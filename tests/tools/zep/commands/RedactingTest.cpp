@@ -86,6 +86,39 @@ TEST_F(RedactingTest, TwoRedactedReportsAreCompared) {
   EXPECT_EQ(OutputOf({"report", "--sample", "--redact", "--redaction-map", "map", "--since", "first.json"}), "no differences\n");
 }
 
+TEST_F(RedactingTest, ReportsThatAreNotRedactedAlikeAreNotCompared) {
+  auto const write = [&](std::string const& file, std::string const& redact, std::string const& map) {
+    Write(file, OutputOf({"report", "--sample", redact, "--redaction-map", map, "--json"}));
+  };
+  Write("original.json", OutputOf({"report", "--sample", "--json"}));
+  write("first.json", "--redact", "map");
+  write("other.json", "--redact", "other");
+  write("serials.json", "--redact=serials", "map");
+  std::string const remedy = "; redact both alike, or give the originals back with zep unredact";
+  auto const whyNot = [&](std::string const& before, std::string const& after) {
+    TRun const run = Run({"diff", before, after, "--json"});
+    EXPECT_EQ(run.fStatus, 66);
+    EXPECT_EQ("zep: " + std::string(JsonOf(run)["reason"]) + "\n", run.fErrors);
+    return run.fErrors;
+  };
+  for (char const* file : {"other.json", "serials.json"})
+    EXPECT_EQ(whyNot("first.json", file), "zep: first.json and " + std::string(file) +
+                                              " cannot be compared: they were redacted with different maps or kinds, so that "
+                                              "their pseudonyms do not agree" +
+                                              remedy + "\n");
+  EXPECT_EQ(whyNot("original.json", "first.json"),
+            "zep: original.json and first.json cannot be compared: only first.json is redacted" + remedy + "\n");
+  EXPECT_EQ(Run({"report", "--sample", "--since", "first.json"}).fStatus, 66);
+}
+
+TEST_F(RedactingTest, AReportWithoutTheSuperclassesIsRefused) {
+  TRun const run = Run({"report", "--from", "a.json", "--redact", "--redaction-map", "map"});
+  EXPECT_EQ(run.fStatus, 66);
+  EXPECT_EQ(run.fErrors,
+            "zep: the report cannot be redacted: an older zep wrote it, without the superclasses of its classes, which decide "
+            "what is a secret\n");
+}
+
 TEST_F(RedactingTest, OnlyKnownKindsAreAccepted) {
   TRun const run = Run({"report", "--sample", "--redact", "serials,names"});
   EXPECT_EQ(run.fStatus, 64);
@@ -177,6 +210,9 @@ TEST_F(RedactingTest, ASentReportAndItsNameAreRedacted) {
       run.fErrors,
       testing::ContainsRegex(
           "zep: the report contains [0-9]+ serials, [0-9]+ hosts?, [0-9]+ address(es)? and [0-9]+ users?, all redacted\n"));
+  TRun const quiet =
+      Run({"report", "--sample", "--redact", "--redaction-map", "map", "--quiet", "--json", "--send", "ftp://127.0.0.1:1/d/"});
+  EXPECT_THAT(quiet.fErrors, Not(HasSubstr("the report contains")));
   std::string const kept = nlohmann::json::parse(run.fOutput)["sent"]["keptIn"];
   EXPECT_THAT(kept, testing::ContainsRegex("zep-report-host-[0-9]+-2"));
   EXPECT_EQ(std::system(("gunzip -c '" + kept + "' > '" + fZep.Path("kept.json") + "'").c_str()), 0);
