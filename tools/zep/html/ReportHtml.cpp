@@ -4,6 +4,7 @@
 #include "MissingValueClass.h"
 #include "collect/stored/ObjectName.h"
 #include "tools/zep/html/Html.h"
+#include "tools/zep/output/FindingsText.h"
 
 #include <string.h>
 
@@ -63,18 +64,10 @@ std::size_t RulesNotAsked(TStoredReport const& report) {
 }
 
 std::string Verdict(TStoredReport const& report) {
-  std::string text;
-  for (char const* severity : {"critical", "error", "warning", "information"}) {
-    auto const count = std::count_if(report.fProblems.begin(), report.fProblems.end(),
-                                     [&](TStoredProblem const& problem) { return problem.fSeverity == severity; });
-    if (count == 0) continue;
-    bool const hasPlural = count > 1 && (severity == std::string("error") || severity == std::string("warning"));
-    text += (text.empty() ? "" : ", ") + std::to_string(count) + " " + severity + (hasPlural ? "s" : "");
-  }
-  bool const isAllAsked = RulesNotAsked(report) == 0;
-  if (text.empty() && isAllAsked) return "<p class=\"verdict fine\">No problem was found</p>\n";
-  if (text.empty()) return "<p class=\"verdict\">No problem was found by the rules that could be asked</p>\n";
-  return "<p class=\"verdict " + Html(report.fProblems.front().fSeverity) + "\">" + text + "</p>\n";
+  bool const isAllAsked = RulesNotAsked(report) == 0, hasNone = report.fProblems.empty();
+  if (hasNone && isAllAsked) return "<p class=\"verdict fine\">No problem was found</p>\n";
+  if (hasNone) return "<p class=\"verdict\">No problem was found by the rules that could be asked</p>\n";
+  return Element("p", "class=\"verdict " + Html(report.fProblems.front().fSeverity) + "\"", CountsOf(report.fProblems)) + "\n";
 }
 
 std::string Problem(TStoredProblem const& problem) {

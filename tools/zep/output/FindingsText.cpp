@@ -15,9 +15,10 @@ using EOutcome = TRuleResult::EOutcome;
 
 constexpr std::size_t kIndent = 13;  // the width of "information" and two blanks
 
-std::string Counted(std::size_t count, ESeverity severity) {
-  bool const hasPlural = severity == ESeverity::kWarning || severity == ESeverity::kError;
-  return std::to_string(count) + " " + NameOf(severity) + (hasPlural && count != 1 ? "s" : "");
+// "2 errors"
+std::string Counted(std::size_t count, std::string const& severity) {
+  bool const hasPlural = severity == "warning" || severity == "error";
+  return std::to_string(count) + " " + severity + (hasPlural && count != 1 ? "s" : "");
 }
 
 std::string Paragraph(std::string const& text) { return Joined(Wrapped(Printable(text), OutputWidth()), "\n") + "\n"; }
@@ -67,21 +68,27 @@ std::vector<std::string> ReasonsOf(TFindings const& findings) {
   return texts;
 }
 
-std::string OutcomeText(TRuleResult const& rule) {
-  if (rule.fOutcome == EOutcome::kWrong) return "wrong";
-  if (rule.fOutcome == EOutcome::kNotAsked) return "not asked: " + rule.fNotAsked.front().fReason;
-  if (rule.HasNothingToExamine()) return "nothing to examine";
-  if (rule.fNotAsked.empty()) return "fine";
-  return "fine, but " + std::to_string(rule.fNotAsked.size()) + " not examined: " + rule.fNotAsked.front().fReason;
+std::string OutcomeText(TStoredRule const& rule) {
+  if (rule.fHasNothingToExamine) return "nothing to examine";
+  std::string const reason = rule.fNotExamined.empty() ? "" : ": " + rule.fNotExamined.front();
+  if (rule.fOutcome == "not-asked") return "not asked" + reason;
+  if (rule.fOutcome == "wrong" || reason.empty()) return rule.fOutcome;
+  return "fine, but " + std::to_string(rule.fNotExamined.size()) + " not examined" + reason;
 }
 
 }  // namespace
 
 std::string CountsOf(TFindings const& findings) {
+  std::vector<TStoredProblem> problems;
+  for (TProblem const& problem : findings.fProblems) problems.push_back({"", NameOf(problem.fSeverity), "", "", ""});
+  return CountsOf(problems);
+}
+
+std::string CountsOf(std::vector<TStoredProblem> const& problems) {
   std::string text;
-  for (ESeverity const severity : {ESeverity::kCritical, ESeverity::kError, ESeverity::kWarning, ESeverity::kInformation}) {
-    auto const count = std::count_if(findings.fProblems.begin(), findings.fProblems.end(),
-                                     [&](TProblem const& problem) { return problem.fSeverity == severity; });
+  for (char const* severity : {"critical", "error", "warning", "information"}) {
+    auto const count = std::count_if(problems.begin(), problems.end(),
+                                     [&](TStoredProblem const& problem) { return problem.fSeverity == severity; });
     if (count > 0) text += (text.empty() ? "" : ", ") + Counted(static_cast<std::size_t>(count), severity);
   }
   return text.empty() ? "nothing wrong" : text;
@@ -98,9 +105,18 @@ std::string FindingsAsText(TFindings const& findings, std::string const& label) 
 }
 
 std::string RulesAsText(TFindings const& findings, std::string const& label) {
+  std::vector<TStoredRule> rules;
+  for (TRuleResult const& rule : findings.fRules) {
+    rules.push_back({rule.fId, rule.fTitle, NameOf(rule.fOutcome), rule.HasNothingToExamine(), {}});
+    for (auto const& notAsked : rule.fNotAsked) rules.back().fNotExamined.push_back(notAsked.fReason);
+  }
+  return RulesAsText(rules, label);
+}
+
+std::string RulesAsText(std::vector<TStoredRule> const& rules, std::string const& label) {
   TTable table({22, 34, 20});
   table.Add({label + "Rule", "Question", "Answer"});
-  for (TRuleResult const& rule : findings.fRules) table.Add({rule.fId, rule.fTitle, MessageWithoutSecrets(OutcomeText(rule))});
+  for (TStoredRule const& rule : rules) table.Add({rule.fId, rule.fQuestion, MessageWithoutSecrets(OutcomeText(rule))});
   return table.GetText();
 }
 

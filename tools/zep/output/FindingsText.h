@@ -2,8 +2,10 @@
 #pragma once
 
 #include "collect/findings/Findings.h"
+#include "collect/stored/StoredReport.h"
 
 #include <string>
+#include <vector>
 
 namespace NQRVZEP20::zep {
 
@@ -13,8 +15,10 @@ std::string FindingsAsText(TFindings const& findings, std::string const& label);
 
 // A table of all rules: what each found, or why it could not be asked.
 std::string RulesAsText(TFindings const& findings, std::string const& label);
+std::string RulesAsText(std::vector<TStoredRule> const& rules, std::string const& label);
 
 // "2 errors, 1 warning", or "nothing wrong".
 std::string CountsOf(TFindings const& findings);
+std::string CountsOf(std::vector<TStoredProblem> const& problems);
 
 }  // namespace NQRVZEP20::zep

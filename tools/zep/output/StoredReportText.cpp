@@ -2,6 +2,7 @@
 #include "tools/zep/output/StoredReportText.h"
 
 #include "MissingValueClass.h"
+#include "tools/zep/output/FindingsText.h"
 #include "tools/zep/output/SectionText.h"
 #include "tools/zep/output/Text.h"
 
@@ -34,13 +35,6 @@ std::string RowsAsText(std::string const& title, std::vector<TStoredRow> const& 
                                                          : "unknown: " + answer.fMissing.fReason;
     table.Add({row.fLabel, value, answer.fSource.empty() ? "none" : answer.fSource});
   }
-  return table.GetText();
-}
-
-std::string RulesAsText(std::vector<TStoredRule> const& rules) {
-  TTable table({46, 10, 20});
-  table.Add({"Question", "Outcome", "Not examined"});
-  for (TStoredRule const& rule : rules) table.Add({rule.fQuestion, rule.fOutcome, Joined(rule.fNotExamined, "; ")});
   return table.GetText();
 }
 
@@ -79,7 +73,7 @@ std::string StoredReportAsText(TStoredReport const& report, TReportParts const& 
   std::string text;
   for (std::string const& line : report.fHead) text += Printable(line) + "\n";
   if (isWanted(kFindingsPart)) text += "\n" + ProblemsAsText(report);
-  if (isNamed(kFindingsPart)) text += "\n" + RulesAsText(report.fRules);
+  if (isNamed(kFindingsPart)) text += "\n" + RulesAsText(report.fRules, label);
   if (isWanted(kIdentityPart)) text += "\n" + RowsAsText(label + "Identity", report.fIdentity);
   if (isWanted(kDetailsPart)) text += "\n" + RowsAsText(label + "Details", report.fDetails);
   for (TReportSection const& section : report.fSections)

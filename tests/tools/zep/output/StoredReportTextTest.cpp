@@ -17,5 +17,15 @@ TEST(StoredReportTextTest, HasTheHeadTheProblemsTheRowsAndTheTables) {
     EXPECT_THAT(text, testing::HasSubstr(part));
 }
 
+// With the words of a report on this machine.
+TEST(StoredReportTextTest, SaysWhichRulesHadNothingToExamine) {
+  std::string const idle = StoredDocumentWith(R"("outcome": "wrong", "examined": 1,)", R"("outcome": "fine", "examined": 0,)");
+  TReportParts const parts = {{"findings"}, false};
+  EXPECT_THAT(StoredReportAsText(StoredReportFrom(idle, "a.json"), parts),
+              testing::ContainsRegex("Rule +Question +Answer *\ndisk-failing +Is a disk failing\\? +nothing to examine"));
+  EXPECT_THAT(StoredReportAsText(StoredReportFrom(StoredDocument(), "a.json"), parts),
+              testing::ContainsRegex("disk-failing +Is a disk failing\\? +wrong"));
+}
+
 }  // namespace
 }  // namespace NQRVZEP20::zep
