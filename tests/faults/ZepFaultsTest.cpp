@@ -44,6 +44,8 @@ TCommand const kCommands[] = {
     {"ReportInProcess", {"report", "--sample", "--in-process", "--json"}, EOutput::kDocument},
     {"ReportAsPage", {"report", "--sample", "--html", "page.html"}, EOutput::kText, "page.html"},
     {"StoredReport", {"report", "--from", "stored.json", "--html", "page.html"}, EOutput::kText, "page.html"},
+    {"RedactedReport", {"report", "--sample", "--redact", "--redaction-map", "map", "--json"}, EOutput::kDocument, "map"},
+    {"Unredact", {"unredact", "redacted.json", "--map", "its-map", "--json"}, EOutput::kDocument},
     {"Diff", {"diff", "stored.json", "stored.json", "--json"}, EOutput::kDocument},
     {"Show", {"show", "--sample", "CIM_Chassis", "--json"}, EOutput::kDocument},
     {"Mof", {"mof", "schema.mof", "--json"}, EOutput::kDocument},
@@ -67,7 +69,7 @@ struct TEnd {
   int fStatus;  // the exit status, or minus the signal
   std::string fOutput, fErrors;
   std::set<std::string> fFiles;  // those that the run made
-  std::string fPage;             // the contents of page.html
+  std::string fMade;             // the contents of the file of the command
   bool fFired;
   std::map<std::string, int> fCalls;
 };
@@ -121,12 +123,18 @@ void ReadCalls(std::string const& file, TEnd& end) {
       end.fCalls[word] = count;
 }
 
-TEnd EndOf(TCommand const& command, std::string const& fault, std::string const& stored) {
+// The files that commands read, by name. Only their owner may read a map.
+using TInputs = std::map<std::string, std::string>;
+
+TEnd EndOf(TCommand const& command, std::string const& fault, TInputs const& inputs) {
   TTempDir const dir;
   fs::create_directory(dir.Path("work"));
   WriteFile(dir.Path("work/schema.mof"), "class X_Disk { [Key] string Name; uint64 Size; };\n");
   WriteFile(dir.Path("work/zep.cfg"), "a=1\n");
-  WriteFile(dir.Path("work/stored.json"), stored);
+  for (auto const& [name, text] : inputs) {
+    WriteFile(dir.Path("work/" + name), text);
+    fs::permissions(dir.Path("work/" + name), fs::perms::owner_read | fs::perms::owner_write);
+  }
   std::set<std::string> const before = NamesIn(dir.Path("work"));
   pid_t const child = ::fork();
   if (child == 0) Exec(dir, command, fault);
@@ -143,7 +151,8 @@ TEnd EndOf(TCommand const& command, std::string const& fault, std::string const&
            {}};
   for (std::string const& name : NamesIn(dir.Path("work")))
     if (before.count(name) == 0) end.fFiles.insert(name);
-  if (end.fFiles.count("page.html") != 0) end.fPage = ReadFile(dir.Path("work/page.html"));
+  std::string const made = dir.Path("work/" + command.fFile);
+  if (fs::is_regular_file(made)) end.fMade = ReadFile(made);
   ReadCalls(dir.Path("calls"), end);
   return end;
 }
@@ -164,7 +173,7 @@ std::vector<int> ErrorsOf(std::string const& function) {
 
 int CallsToFail() {
   char const* const number = ::getenv("ZEP_FAULT_CALLS");
-  return number != nullptr ? std::atoi(number) : 2;
+  return number != nullptr ? std::max(1, std::atoi(number)) : 2;
 }
 
 std::vector<TFault> FaultsOf(std::map<std::string, int> const& calls) {
@@ -190,8 +199,8 @@ void ExpectDocument(TEnd const& end, TFault const& fault) {
 
 void ExpectWholePage(TEnd const& end) {
   if (end.fFiles.count("page.html") == 0) return;
-  EXPECT_EQ(end.fPage.compare(0, 15, "<!DOCTYPE html>"), 0);
-  EXPECT_NE(end.fPage.find("</html>"), std::string::npos);
+  EXPECT_EQ(end.fMade.compare(0, 15, "<!DOCTYPE html>"), 0);
+  EXPECT_NE(end.fMade.find("</html>"), std::string::npos);
 }
 
 void ExpectGoodEnd(TCommand const& command, TEnd const& end, TFault const& fault, TEnd const& usual) {
@@ -201,13 +210,23 @@ void ExpectGoodEnd(TCommand const& command, TEnd const& end, TFault const& fault
     ExpectWholePage(end);
     return;
   }
+  bool const isEndOfLibrary = end.fErrors.find("in libgcrypt: ") != std::string::npos;  // which ends a program without /proc
+  if (isEndOfLibrary) return;
   EXPECT_EQ(documented.count(end.fStatus), 1u) << end.fStatus << "\n" << end.fErrors;
-  EXPECT_TRUE(end.fStatus == usual.fStatus || !end.fErrors.empty() || end.fOutput != usual.fOutput || end.fPage != usual.fPage)
+  EXPECT_TRUE(end.fStatus == usual.fStatus || !end.fErrors.empty() || end.fOutput != usual.fOutput || end.fMade != usual.fMade)
       << "no message";
   if (command.fOutput == EOutput::kDocument) ExpectDocument(end, fault);
   EXPECT_TRUE(command.fFile.empty() || end.fStatus != 0 || end.fFiles.count(command.fFile) == 1) << "no file";
-  for (std::string const& file : end.fFiles) EXPECT_EQ(file, command.fFile) << "is left";
+  for (std::string const& file : end.fFiles)  // an empty lock may be left, and is used again
+    EXPECT_TRUE(file == command.fFile || file == command.fFile + ".lock") << file << " is left";
   ExpectWholePage(end);
+}
+
+// A report, and the same redacted with its map.
+TInputs MakeInputs() {
+  TEnd const redacted =
+      EndOf({"", {"report", "--sample", "--redact", "--redaction-map", "map", "--json"}, EOutput::kDocument, "map"}, "", {});
+  return {{"stored.json", EndOf(kCommands[1], "", {}).fOutput}, {"redacted.json", redacted.fOutput}, {"its-map", redacted.fMade}};
 }
 
 class ZepFaultsTest : public testing::TestWithParam<TCommand> {
@@ -217,15 +236,15 @@ protected:
 
 TEST_P(ZepFaultsTest, EndsWellWhateverFails) {
   TCommand const& command = GetParam();
-  std::string const stored = EndOf(kCommands[1], "", "").fOutput;
-  TEnd const usual = EndOf(command, "", stored);
+  TInputs const inputs = MakeInputs();
+  TEnd const usual = EndOf(command, "", inputs);
   ExpectGoodEnd(command, usual, {"", 0, 0}, usual);
   int fired = 0;
   std::vector<TFault> const faults = FaultsOf(usual.fCalls);
   for (TFault const& fault : faults) {
     SCOPED_TRACE(testing::PrintToString(fault));
     TEnd const end =
-        EndOf(command, fault.fFunction + ":" + std::to_string(fault.fNumber) + ":" + std::to_string(fault.fError), stored);
+        EndOf(command, fault.fFunction + ":" + std::to_string(fault.fNumber) + ":" + std::to_string(fault.fError), inputs);
     ExpectGoodEnd(command, end, fault, usual);
     fired += end.fFired || end.fStatus < 0 ? 1 : 0;
   }
