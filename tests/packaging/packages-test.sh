@@ -61,6 +61,10 @@ for command in "" report "plugin new"; do
     fail "the manual page of zep $command differs from its help:" "$work/log"
 done
 
+for file in bash-completion/completions/zep fish/vendor_completions.d/zep.fish zsh/vendor-completions/_zep; do
+  grep -q 'Completion of zep' "$work/root/usr/share/$file" || fail "$file does not complete the command line of zep"
+done
+
 cd "$work"
 "$zep" plugin new Everything --class X_Everything --mof "$here/everything.mof" >"$work/log" || fail "zep plugin new failed"
 cmake -G Ninja -S Everything -B project -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$work/root/usr" >"$work/log" ||

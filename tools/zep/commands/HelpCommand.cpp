@@ -3,6 +3,7 @@
 // zep help: how zep, or one of its commands, is called.
 
 #include "tools/zep/commands/Commands.h"
+#include "tools/zep/completion/Completion.h"
 #include "tools/zep/output/ExitStatus.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"
@@ -18,6 +19,7 @@ namespace {
 
 struct TArguments {
   std::vector<std::string> fCommand;  // "media mount"; empty for zep itself
+  std::string fShell;                 // whose completion is printed; empty for help
   bool fAsJson = false;
 };
 
@@ -36,10 +38,12 @@ std::string HelpOf(CLI::App const& zep, std::vector<std::string> const& words) {
 }
 
 int Help(CLI::App const& zep, TArguments const& arguments) {
-  std::string const help = HelpOf(zep, arguments.fCommand);
+  bool const isHelp = arguments.fShell.empty();
+  if (!isHelp && !arguments.fCommand.empty()) throw TWrongUsage("--completion is for all commands together");
+  std::string const text = isHelp ? HelpOf(zep, arguments.fCommand) : CompletionFor(arguments.fShell, zep);
   TJson document = DocumentHead("zep help", kExitComplete, "");
-  document["text"] = help;
-  WriteOutput(arguments.fAsJson ? AsText(document) : help);
+  document["text"] = text;
+  WriteOutput(arguments.fAsJson ? AsText(document) : text);
   return kExitComplete;
 }
 
@@ -54,6 +58,11 @@ CLI::App const* CommandNamed(CLI::App const& app, std::string const& name) {
 TRun AddHelpArguments(CLI::App& command) {
   auto const arguments = std::make_shared<TArguments>();
   command.add_option("command", arguments->fCommand, "The command; without one, all commands are listed");
+  command
+      .add_option("--completion", arguments->fShell,
+                  "Print the script with which this shell completes the command line of zep, instead of the help")
+      ->check(CLI::IsMember(ShellsWithCompletion()).description("bash, fish or zsh"))
+      ->type_name("SHELL");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document, with the text in it");
   command.footer(
       "The same as zep --help and zep COMMAND --help.\n"

@@ -156,6 +156,7 @@ TEST_F(EnvelopeTest, EveryCommandThatFailsPrintsADocumentWithItsExitStatus) {
       {"zep proxy-check", 68, {"proxy-check", "--json", "127.0.0.1:1"}},
       {"zep proxy-check", 64, {"proxy-check", "--json", "127.0.0.1"}},
       {"zep help", 64, {"help", "--json", "bogus"}},
+      {"zep help", 64, {"help", "--json", "--completion", "bash", "report"}},
   };
   for (TRow const& row : rows) Expect(row);
   EXPECT_THAT(Missing(rows, {"zep wpad"}), testing::IsEmpty()) << "zep wpad has a test of its own, below";
@@ -191,6 +192,7 @@ TEST_F(EnvelopeTest, EveryCommandThatSucceedsPrintsADocumentWithItsExitStatus) {
       {"zep config", 0, {"config", "--json", "a"}},
       {"zep run", 0, {"run", "--json", "echo", "--json=x"}},
       {"zep help", 0, {"help", "--json"}},
+      {"zep help", 0, {"help", "--json", "--completion", "bash"}},
       {"zep help", 0, {"help", "--json", "media", "mount"}},
   };
   for (TRow const& row : rows) Expect(row);
