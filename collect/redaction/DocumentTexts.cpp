@@ -26,16 +26,6 @@ bool IsName(std::string_view member, TJson const& value, TPlace const& place) {
 
 bool IsIdentifierByte(char byte) { return byte == '_' || IsLetterOrDigit(byte); }
 
-// Whether the object is a property whose value is a number or a time, perhaps as a text.
-bool IsNumber(TJson const& object) {
-  constexpr std::string_view numbers[] = {"uint", "sint", "real", "boolean", "datetime"};
-  auto const type = object.find("type");
-  if (type == object.end() || !type->is_string()) return false;
-  std::string_view const name = type->get_ref<std::string const&>();
-  return std::any_of(std::begin(numbers), std::end(numbers),
-                     [&](std::string_view number) { return name.substr(0, number.size()) == number; });
-}
-
 class TTextWriter {
 public:
   TTextWriter(TJson const& document, TUseText const& use) : fUse(use) {
@@ -86,6 +76,15 @@ private:
 };
 
 }  // namespace
+
+bool IsNumber(nlohmann::ordered_json const& object) {
+  constexpr std::string_view numbers[] = {"uint", "sint", "real", "boolean", "datetime"};
+  auto const type = object.find("type");
+  if (type == object.end() || !type->is_string()) return false;
+  std::string_view const name = type->get_ref<std::string const&>();
+  return std::any_of(std::begin(numbers), std::end(numbers),
+                     [&](std::string_view number) { return name.substr(0, number.size()) == number; });
+}
 
 void RewriteTexts(nlohmann::ordered_json& document, TUseText const& use) {
   TTextWriter(document, use).Rewrite(document, TPlace(nullptr, ""));

@@ -23,6 +23,9 @@ private:
   std::string_view fName;
 };
 
+// Whether the object is a property whose value is a number or a time, perhaps as a text.
+bool IsNumber(nlohmann::ordered_json const& object);
+
 // Replaces each text of the document of a report by the one that `use` returns for it, if it returns one. Names that zep and the
 // classes define are omitted: titles, codes, types, classes, namespaces; of an object path, the namespace and the class. So are
 // texts of numbers and times.

@@ -18,6 +18,7 @@ using TJson = nlohmann::ordered_json;
 using TKinds = std::vector<ESecretKind>;
 
 constexpr char const* kRedaction = "redaction";
+constexpr char const* kRedactedCode = "redacted";  // why a number is null; the reason is its pseudonym
 
 // Whether the property contains domains: their first labels are words such as "dev".
 bool IsDomain(std::string const& property) {
@@ -59,6 +60,36 @@ void AddLast(TJson& object, char const* name, TJson value) {
   object = std::move(members);
 }
 
+// A number that is a secret, which cannot become a pseudonym.
+struct TNumber {
+  TJson* fProperty;
+  TSecret fSecret;
+};
+
+void Redact(TNumber const& number, TPseudonyms& pseudonyms) {
+  TJson& property = *number.fProperty;
+  property["reason"] = pseudonyms.For(&number.fSecret, property["value"].dump());
+  property["code"] = kRedactedCode;
+  property["value"] = nullptr;
+}
+
+void UnredactNumber(TJson& property, TPseudonyms const& pseudonyms) {
+  std::string const reason = property["reason"].get<std::string>();
+  std::string const* const spelling = pseudonyms.SpellingOf(reason);
+  TJson const value = spelling == nullptr ? TJson() : TJson::parse(*spelling, nullptr, false);
+  if (value.is_null() || value.is_discarded()) throw TRedactionError(reason + " is not a number in the map");
+  property["value"] = value;
+  property.erase("code");
+  property.erase("reason");
+}
+
+template <class TUse>
+void ForEachRedactedNumber(TJson& document, TUse use) {
+  for (TJson& instance : document["instances"])
+    for (auto& [name, property] : instance["properties"].get_ref<TJson::object_t&>())
+      if (property.value("code", TJson()) == kRedactedCode) use(property);
+}
+
 // Collects the secrets of a document.
 class TCollector {
 public:
@@ -67,12 +98,15 @@ public:
   void Collect(TJson& document) {
     if (auto const classes = document.find("classes"); classes != document.end()) ReadClasses(*classes);
     for (char const* rows : {"identity", "details"}) CollectRows(document[rows]);
-    for (TJson const& instance : document["instances"]) CollectInstance(instance);
+    for (TJson& instance : document["instances"]) CollectInstance(instance);
     RewriteTexts(document, [&](std::string_view text, TPlace const& place) {
       CollectShapes(text, IsMessage(place.Name()));
       return std::nullopt;
     });
   }
+
+  // Valid as long as the document keeps its members.
+  std::vector<TNumber> const& Numbers() const { return fNumbers; }
 
 private:
   void ReadClasses(TJson const& classes) {
@@ -95,19 +129,28 @@ private:
       if (auto const kind = KindOfRow(key)) AddAll(*kind, row["value"]);
   }
 
-  void CollectInstance(TJson const& instance) {
+  void CollectInstance(TJson& instance) {
     auto const& classes = LineOf(instance["class"].get_ref<std::string const&>());
-    TJson const& properties = instance["properties"];
-    for (auto const& [name, property] : properties.get_ref<TJson::object_t const&>()) {
+    TJson& properties = instance["properties"];
+    for (auto& [name, property] : properties.get_ref<TJson::object_t&>()) {
       TJson const& value = property["value"];
       if (IsDomain(name))
         ForEachString(value, [&](std::string const& text) { Add(ESecretKind::kHosts, text); });
       else if (auto const kind = KindOfProperty(classes, name))
-        AddAll(*kind, value);
+        AddProperty(*kind, property);
       if (name == "InstanceID") ForEachString(value, [&](std::string const& text) { AddIdOfPool(text); });
       if (name == "OtherIdentifyingInfo") CollectDescribed(properties, value);
       if (IsFreeText(name)) ForEachString(value, [&](std::string const& text) { CollectShapes(text, true); });
     }
+  }
+
+  void AddProperty(ESecretKind kind, TJson& property) {
+    TJson const& value = property["value"];
+    if (!IsNumber(property)) return AddAll(kind, value);
+    std::string const text = value.is_string() ? value.get<std::string>() : value.dump();
+    if (value.is_null() || IsPlaceholder(kind, text) || !IsIn(fKinds, kind)) return;
+    fIndex.Add(kind, text);
+    fNumbers.push_back({&property, {kind, text}});
   }
 
   // The elements of OtherIdentifyingInfo that IdentifyingDescriptions calls a serial number.
@@ -162,6 +205,7 @@ private:
 
   TSecretIndex& fIndex;
   TKinds fKinds;
+  std::vector<TNumber> fNumbers;
   std::unordered_map<std::string, std::vector<std::string>> fClasses;
 };
 
@@ -190,9 +234,12 @@ void Redact(TJson& document, TKinds const& kinds, TPseudonyms& pseudonyms) {
   TSecretIndex index;
   for (TSecret const& secret : pseudonyms.Secrets())
     if (IsIn(kinds, secret.fKind)) index.Add(secret.fKind, secret.fValue);
-  TCollector(index, kinds).Collect(document);
+  ForEachRedactedNumber(document, [](TJson const&) { throw TRedactionError("a number of it is redacted already"); });
+  TCollector collector(index, kinds);
+  collector.Collect(document);
   auto const replace = [&](TSecret const* secret, std::string const& spelling) { return pseudonyms.For(secret, spelling); };
   RewriteTexts(document, [&](std::string_view text, TPlace const&) { return index.Rewritten(text, replace); });
+  for (TNumber const& number : collector.Numbers()) Redact(number, pseudonyms);
   TJson names = TJson::array();
   for (ESecretKind const kind : kinds) names.push_back(NameOf(kind));
   AddLast(document, kRedaction, {{"kinds", names}, {"map", pseudonyms.Id()}});
@@ -202,6 +249,7 @@ void Unredact(TJson& document, TPseudonyms const& pseudonyms) {
   if (!IsRedacted(document)) throw TRedactionError("it is not redacted");
   if (RedactedWith(document).fMap != pseudonyms.Id()) throw TRedactionError("it was redacted with another map");
   document.erase(kRedaction);
+  ForEachRedactedNumber(document, [&](TJson& property) { UnredactNumber(property, pseudonyms); });
   TSecretIndex const none;
   RewriteTexts(document, [&](std::string_view text, TPlace const& place) {
     return none.Rewritten(text, [&](TSecret const*, std::string const& pseudonym) {

@@ -159,6 +159,32 @@ TEST(RedactionTest, NumbersAndTimesRemain) {
   EXPECT_THAT(Redacted(document), testing::HasSubstr(R"("type":"uint64","value":"123987")"));
 }
 
+// So that the type of the value remains true.
+TEST(RedactionTest, ANumberThatIsASecretBecomesNullWithItsPseudonymAsTheReason) {
+  TJson document = DocumentWith(InstanceOf("X_Thing", {{"SerialNumber", PropertyOf("uint64", "12398765")},
+                                                       {"AssetTag", PropertyOf("uint32", 4711081)},
+                                                       {"GUID", PropertyOf("uint8[]", {17, 3, 250})},
+                                                       {"UUID", PropertyOf("uint32", 0)}}));
+  document["head"][0] = "the disk 12398765 in rack 4711081";
+  TJson redacted = document;
+  TPseudonyms pseudonyms("1");
+  Redact(redacted, AllKinds(), pseudonyms);
+  TJson const& properties = redacted["instances"].back()["properties"];
+  for (char const* name : {"SerialNumber", "AssetTag", "GUID"}) {
+    EXPECT_TRUE(properties[name]["value"].is_null()) << name;
+    EXPECT_EQ(properties[name]["code"], "redacted") << name;
+    EXPECT_THAT(properties[name]["reason"].get<std::string>(), testing::StartsWith("serial-")) << name;
+  }
+  EXPECT_EQ(properties["UUID"]["value"], 0);
+  for (char const* secret : {"12398765", "4711081", "250"})
+    EXPECT_THAT(redacted.dump(), testing::Not(testing::HasSubstr(secret)));
+  TJson twice = redacted;
+  twice.erase("redaction");
+  EXPECT_THROW(Redact(twice, AllKinds(), pseudonyms), TRedactionError);
+  Unredact(redacted, pseudonyms);
+  EXPECT_EQ(redacted.dump(), document.dump());
+}
+
 TEST(RedactionTest, TheOriginalIsGivenBackByteForByte) {
   TJson document = DocumentWith("SerialNumber", "ZX81-77");
   document["head"] = {"zx81-77 and ZX81_77 and xxZX81-77, text-1 and serial-1, host-2b", "5a583831 5a5838312d3737 enxZX8177"};
