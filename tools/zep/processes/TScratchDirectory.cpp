@@ -1,10 +1,13 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/processes/TScratchDirectory.h"
 
+#include "collect/SafeText.h"
+
 #include <stdlib.h>
 
 #include <cerrno>
 #include <filesystem>
+#include <iostream>
 #include <system_error>
 
 namespace NQRVZEP20::zep {
@@ -17,8 +20,11 @@ TScratchDirectory::TScratchDirectory(std::string const& name) : fPath((fs::temp_
 }
 
 TScratchDirectory::~TScratchDirectory() {
-  std::error_code ignored;
-  if (!fIsKept) fs::remove_all(fPath, ignored);
+  if (fIsKept) return;
+  std::error_code failure;
+  fs::remove_all(fPath, failure);
+  if (failure)
+    std::cerr << "zep: the temporary directory " << Printable(fPath) << " cannot be removed: " << failure.message() << "\n";
 }
 
 }  // namespace NQRVZEP20::zep

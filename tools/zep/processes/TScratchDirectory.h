@@ -5,7 +5,8 @@
 
 namespace NQRVZEP20::zep {
 
-// A new temporary directory, which the destructor removes with its contents unless Keep has been called.
+// A new temporary directory, which the destructor removes with its contents unless Keep has been called. If it cannot be removed,
+// its path and the reason are printed to standard error.
 class TScratchDirectory {
 public:
   // Its name begins with `name`. Throws std::system_error when it cannot be created.
