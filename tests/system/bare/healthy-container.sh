@@ -17,10 +17,9 @@ mkdir "$work/bin"
 cp "$build/bin/zep" "$work/bin/"
 cp -r "$build/lib" "$work/"
 
-# The libraries that the plug-ins need and zep does not: the tree has those of zep.
-libraries_of() { ldd "$@" | awk '/=> \//{print $3}' | sort -u; }
-libraries_of "$build/bin/zep" > "$work/of-zep"
-libraries_of "$build"/lib/*.nsp.so | comm -13 "$work/of-zep" - | xargs cp -t "$work/lib"
+# The libraries of zep and the plug-ins, but those of libc6, which belong to the tree's loader.
+ldd "$build/bin/zep" "$build"/lib/*.nsp.so | awk '/=> \// { print $3 }' | grep -v "^$build/" |
+  grep -Ev '/lib(c|dl|m|pthread|resolv|rt)[.]so[.]' | sort -u | xargs cp -t "$work/lib"
 
 # The container has only null in /dev. zep ends with 2 if the machine has no serial number.
 cat > "$work/ask" <<'END'

@@ -8,6 +8,7 @@
 #include <cerrno>
 #include <filesystem>
 #include <iostream>
+#include <new>
 #include <system_error>
 
 namespace NQRVZEP20::zep {
@@ -22,7 +23,11 @@ TScratchDirectory::TScratchDirectory(std::string const& name) : fPath((fs::temp_
 TScratchDirectory::~TScratchDirectory() {
   if (fIsKept) return;
   std::error_code failure;
-  fs::remove_all(fPath, failure);
+  try {
+    fs::remove_all(fPath, failure);
+  } catch (std::bad_alloc const&) {
+    failure = std::make_error_code(std::errc::not_enough_memory);
+  }
   if (failure)
     std::cerr << "zep: the temporary directory " << Printable(fPath) << " cannot be removed: " << failure.message() << "\n";
 }
