@@ -3,12 +3,13 @@
 
 #include "collect/SafeText.h"
 
+#include <ftw.h>
+#include <stdio.h>
 #include <stdlib.h>
 
 #include <cerrno>
 #include <filesystem>
 #include <iostream>
-#include <new>
 #include <system_error>
 
 namespace NQRVZEP20::zep {
@@ -22,14 +23,12 @@ TScratchDirectory::TScratchDirectory(std::string const& name) : fPath((fs::temp_
 
 TScratchDirectory::~TScratchDirectory() {
   if (fIsKept) return;
-  std::error_code failure;
-  try {
-    fs::remove_all(fPath, failure);
-  } catch (std::bad_alloc const&) {
-    failure = std::make_error_code(std::errc::not_enough_memory);
-  }
-  if (failure)
-    std::cerr << "zep: the temporary directory " << Printable(fPath) << " cannot be removed: " << failure.message() << "\n";
+  // Not std::filesystem::remove_all, which ends the program when memory runs out.
+  constexpr int descriptors = 16;
+  auto const removeEntry = [](char const* path, struct stat const*, int, FTW*) { return ::remove(path); };
+  if (::nftw(fPath.c_str(), removeEntry, descriptors, FTW_DEPTH | FTW_PHYS) == 0 || errno == ENOENT) return;
+  std::string const why = std::generic_category().message(errno);
+  std::cerr << "zep: the temporary directory " << Printable(fPath) << " cannot be removed: " << why << "\n";
 }
 
 }  // namespace NQRVZEP20::zep

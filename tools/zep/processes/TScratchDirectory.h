@@ -6,7 +6,8 @@
 namespace NQRVZEP20::zep {
 
 // A new temporary directory, which the destructor removes with its contents unless Keep has been called. If it cannot be removed,
-// its path and the reason are printed to standard error.
+// its path and the reason are printed to standard error. It may be left when memory runs out in a place where no exception can be
+// caught, which ends zep.
 class TScratchDirectory {
 public:
   // Its name begins with `name`. Throws std::system_error when it cannot be created.

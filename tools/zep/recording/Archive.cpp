@@ -5,6 +5,7 @@
 
 #include <archive_entry.h>
 
+#include <cerrno>
 #include <new>
 #include <utility>
 
@@ -34,9 +35,15 @@ std::string WithoutEndSlash(std::string name) {
   return name;
 }
 
-la_ssize_t Append(archive*, void* bytes, void const* buffer, std::size_t length) {
-  static_cast<std::string*>(bytes)->append(static_cast<char const*>(buffer), length);
-  return static_cast<la_ssize_t>(length);
+// Called by libarchive, through which no exception may pass.
+la_ssize_t Append(archive* of, void* bytes, void const* buffer, std::size_t length) {
+  try {
+    static_cast<std::string*>(bytes)->append(static_cast<char const*>(buffer), length);
+    return static_cast<la_ssize_t>(length);
+  } catch (std::bad_alloc const&) {
+    archive_set_error(of, ENOMEM, "not enough memory");
+    return ARCHIVE_FATAL;
+  }
 }
 
 void Check(archive* of, bool isGood) {
@@ -56,6 +63,7 @@ TArchiveWriter::TArchiveWriter() : fArchive(archive_write_new(), archive_write_f
 
 void TArchiveWriter::Add(TMember const& member, std::string const& content) {
   std::unique_ptr<archive_entry, void (*)(archive_entry*)> const entry(archive_entry_new(), archive_entry_free);
+  if (!entry) throw std::bad_alloc();
   archive_entry_set_pathname(entry.get(), member.fName.c_str());
   archive_entry_set_filetype(entry.get(), TypeOf(member.fKind));
   archive_entry_set_perm(entry.get(), member.fMode);
