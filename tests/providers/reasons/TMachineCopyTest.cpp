@@ -88,7 +88,7 @@ TEST_F(TMachineCopyTest, AFileThatWasOnlyListedIsNotReadAsEmpty) {
   EXPECT_EQ(Text(Replayed().Content("/sys/devices/eth0/speed")), "1000\n");
 }
 
-// The reader was another user than root, whoever replays it.
+// The user who recorded was not root; the user who replays may be.
 TEST_F(TMachineCopyTest, ARefusalIsGivenAgain) {
   Write("refused", "refused 13 user");
   ::chmod(fMachine.Path("refused").c_str(), 01400);
