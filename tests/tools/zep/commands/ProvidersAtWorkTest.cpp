@@ -20,7 +20,18 @@ namespace {
 using testing::AllOf;
 using testing::HasSubstr;
 
-using ProvidersAtWorkTest = TMisbehavingPlugInsTest;
+class ProvidersAtWorkTest : public TMisbehavingPlugInsTest {
+protected:
+  // Interrupts the running zep while it fills the plug-in Hangs: it ends by the signal, and the plug-in with it.
+  void InterruptWhileItHangs(pid_t zep) const {
+    WaitFor("Hangs");
+    ::kill(zep, SIGINT);
+    int status = 0;
+    ::waitpid(zep, &status, 0);
+    EXPECT_TRUE(WIFSIGNALED(status) && WTERMSIG(status) == SIGINT);
+    ExpectNoProcess("Hangs");
+  }
+};
 
 TEST_F(ProvidersAtWorkTest, PlugInsThatHangOrStopAreEndedAtTheTimeLimit) {
   fZep.Remove("libHost.nsp.so");
@@ -152,12 +163,7 @@ TEST_F(ProvidersAtWorkTest, APlugInThatPrintsForEverIsEndedAndItsWordsAreCut) {
 TEST_F(ProvidersAtWorkTest, AnInterruptLeavesNoProcess) {
   Add({"Hangs"});
   pid_t const zep = StartReport();
-  WaitFor("Hangs");
-  ::kill(zep, SIGINT);
-  int status = 0;
-  ::waitpid(zep, &status, 0);
-  EXPECT_TRUE(WIFSIGNALED(status) && WTERMSIG(status) == SIGINT);
-  ExpectNoProcess("Hangs");
+  InterruptWhileItHangs(zep);
 }
 
 TEST_F(ProvidersAtWorkTest, AnInterruptedRecordingLeavesNoFiles) {
@@ -171,12 +177,7 @@ TEST_F(ProvidersAtWorkTest, AnInterruptedRecordingLeavesNoFiles) {
     ::execl(fZep.Path("bin/zep").c_str(), "zep", "record", file.c_str(), nullptr);
     ::_exit(127);
   }
-  WaitFor("Hangs");
-  ::kill(zep, SIGINT);
-  int status = 0;
-  ::waitpid(zep, &status, 0);
-  EXPECT_TRUE(WIFSIGNALED(status) && WTERMSIG(status) == SIGINT);
-  ExpectNoProcess("Hangs");
+  InterruptWhileItHangs(zep);
   EXPECT_TRUE(fs::is_empty(temporary.Path()));
   EXPECT_FALSE(fs::exists(file));
 }
