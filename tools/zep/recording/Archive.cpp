@@ -102,14 +102,21 @@ std::optional<TMember> TArchiveReader::Next() {
 
 std::string TArchiveReader::Content(std::uint64_t limit) {
   std::string content;
+  Read(limit, [&](std::string_view piece) { content += piece; });
+  return content;
+}
+
+void TArchiveReader::Read(std::uint64_t limit, std::function<void(std::string_view)> const& use) {
+  std::uint64_t bytes = 0;
   char buffer[kBlock];
   for (;;) {
     la_ssize_t const count = archive_read_data(fArchive.get(), buffer, sizeof buffer);
-    if (count == 0) return content;
+    if (count == 0) return;
     if (count < 0) Throw(" in its member " + Printable(fName));
-    content.append(buffer, static_cast<std::size_t>(count));
-    if (content.size() > limit)
+    bytes += static_cast<std::uint64_t>(count);
+    if (bytes > limit)
       throw TArchiveError("its member " + Printable(fName) + " is longer than " + std::to_string(limit) + " bytes");
+    use({buffer, static_cast<std::size_t>(count)});
   }
 }
 

@@ -6,10 +6,12 @@
 #include <sys/types.h>
 #include <cstdint>
 #include <ctime>
+#include <functional>
 #include <memory>
 #include <optional>
 #include <stdexcept>
 #include <string>
+#include <string_view>
 
 struct archive_entry;
 
@@ -58,6 +60,9 @@ public:
 
   // The content of the current member, which is an error if it is longer than `limit` bytes.
   std::string Content(std::uint64_t limit);
+
+  // The same, passed to `use` piece by piece.
+  void Read(std::uint64_t limit, std::function<void(std::string_view piece)> const& use);
 
 private:
   [[noreturn]] void Throw(std::string const& where) const;

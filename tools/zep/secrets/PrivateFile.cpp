@@ -68,10 +68,10 @@ std::string TPrivateFile::WhyNotPrivate() const {
   return (fMode & (S_IRWXG | S_IRWXO)) == 0 ? "" : "other users can read or change it; chmod 600 makes it private";
 }
 
-void TPrivateFile::WarnWhenOthersMayRead() const {
+void TPrivateFile::WarnWhenOthersMayRead(std::string const& secrets) const {
   static std::set<std::string> warned;
   if (!S_ISREG(fMode) || (fMode & S_IROTH) == 0 || !warned.insert(fPath).second) return;
-  std::cerr << "zep: warning: every user may read the passwords in " << Printable(fPath) << " (mode " << Octal(fMode)
+  std::cerr << "zep: warning: every user may read " << secrets << " in " << Printable(fPath) << " (mode " << Octal(fMode)
             << "); chmod 600 makes it private\n";
 }
 

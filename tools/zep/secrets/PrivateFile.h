@@ -27,7 +27,7 @@ public:
   std::string WhyNotPrivate() const;
 
   // Prints a warning to standard error, once per path, if it is a regular file that every user may read.
-  void WarnWhenOthersMayRead() const;
+  void WarnWhenOthersMayRead(std::string const& secrets = "the passwords") const;
 
 private:
   std::string fPath;

@@ -16,11 +16,6 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct THashCloser {
-  void operator()(gcry_md_hd_t hash) const noexcept { gcry_md_close(hash); }
-};
-using THash = std::unique_ptr<gcry_md_handle, THashCloser>;
-
 // libgcrypt must be initialised before its first use. It needs no locked memory for checksums.
 bool InitialiseLibrary() {
   if (gcry_check_version(GCRYPT_VERSION) == nullptr) return false;
@@ -29,13 +24,13 @@ bool InitialiseLibrary() {
   return true;
 }
 
-THash NewHash() {
+gcry_md_hd_t NewHash() {
   static bool const isInitialised = InitialiseLibrary();
   if (!isInitialised) throw std::runtime_error("libgcrypt is older than " GCRYPT_VERSION);
   gcry_md_hd_t hash = nullptr;
   gcry_error_t const error = gcry_md_open(&hash, GCRY_MD_SHA256, 0);
   if (error != 0) throw std::runtime_error(std::string("libgcrypt: ") + gcry_strerror(error));
-  return THash(hash);
+  return hash;
 }
 
 std::string DigitsOf(unsigned char const* bytes, std::size_t size) {
@@ -50,24 +45,32 @@ std::string DigitsOf(unsigned char const* bytes, std::size_t size) {
 
 }  // namespace
 
+TSha256::TSha256() : fHash(NewHash(), gcry_md_close) {}
+
+void TSha256::Add(std::string_view bytes) { gcry_md_write(fHash.get(), bytes.data(), bytes.size()); }
+
+std::string TSha256::Digits() const {
+  return DigitsOf(gcry_md_read(fHash.get(), GCRY_MD_SHA256), gcry_md_get_algo_dlen(GCRY_MD_SHA256));
+}
+
 std::string Sha256Of(std::string const& file) {
   std::unique_ptr<std::FILE, int (*)(std::FILE*)> const stream(std::fopen(file.c_str(), "rb"), std::fclose);
   if (!stream) throw std::system_error(errno, std::generic_category(), file);
-  THash const hash = NewHash();
-  std::vector<unsigned char> chunk(65536);
+  TSha256 sum;
+  std::vector<char> chunk(65536);
   while (std::size_t const got = std::fread(chunk.data(), 1, chunk.size(), stream.get())) {
     if (PendingInterrupt() != 0) return "";
-    gcry_md_write(hash.get(), chunk.data(), got);
+    sum.Add({chunk.data(), got});
   }
   if (PendingInterrupt() != 0) return "";
   if (std::ferror(stream.get()) != 0) throw std::system_error(EIO, std::generic_category(), file);
-  return DigitsOf(gcry_md_read(hash.get(), GCRY_MD_SHA256), gcry_md_get_algo_dlen(GCRY_MD_SHA256));
+  return sum.Digits();
 }
 
 std::string Sha256OfText(std::string const& text) {
-  THash const hash = NewHash();
-  gcry_md_write(hash.get(), text.data(), text.size());
-  return DigitsOf(gcry_md_read(hash.get(), GCRY_MD_SHA256), gcry_md_get_algo_dlen(GCRY_MD_SHA256));
+  TSha256 sum;
+  sum.Add(text);
+  return sum.Digits();
 }
 
 }  // namespace NQRVZEP20::zep
