@@ -92,12 +92,16 @@ void RedactAsSecrets(std::string const& text) {
                             {"AccessInfo", PropertyOf(address)},
                             {"IPAddress", PropertyOf(address)},
                             {"UserID", PropertyOf(user)},
+                            {"Source", PropertyOf(host)},
+                            {"FileSystemOptions", PropertyOf(text)},
+                            {"KernelCommandLine", PropertyOf(text)},
                             {"Message", PropertyOf(text)}}}};
-  TJson const redacted = RedactedAndBack({{"head", head},
-                                          {"identity", TJson::object()},
-                                          {"details", TJson::object()},
-                                          {"classes", {{{"class", "X"}, {"superclasses", {"CIM_RemoteServiceAccessPoint"}}}}},
-                                          {"instances", {instance}}});
+  TJson const redacted =
+      RedactedAndBack({{"head", head},
+                       {"identity", TJson::object()},
+                       {"details", TJson::object()},
+                       {"classes", {{{"class", "X"}, {"superclasses", {"CIM_RemoteServiceAccessPoint", "ZEP_Mount"}}}}},
+                       {"instances", {instance}}});
   bool const isPath = serial.find(':') != serial.npos;
   Require(isPath || IsPlaceholder(ESecretKind::kSerials, serial) || redacted.at("head").at(0) != serial);
 }

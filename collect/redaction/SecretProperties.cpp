@@ -11,70 +11,74 @@ namespace NQRVZEP20 {
 
 namespace {
 
-using EKind = ESecretKind;
-
 struct TSecretProperty {
   std::string_view fClass;  // also of its subclasses; empty for every class
   std::string_view fProperty;
-  EKind fKind;
+  EMeaning fMeaning;
 };
 
 constexpr TSecretProperty kProperties[] = {
-    {"", "SerialNumber", EKind::kSerials},
-    {"", "IdentifyingNumber", EKind::kSerials},
-    {"", "AssetTag", EKind::kSerials},
-    {"", "UserTracking", EKind::kSerials},
-    {"", "UUID", EKind::kSerials},
-    {"", "GUID", EKind::kSerials},
-    {"", "ContentUUID", EKind::kSerials},
-    {"", "TableUUID", EKind::kSerials},
-    {"", "EntryUUID", EKind::kSerials},
-    {"", "MachineID", EKind::kSerials},
-    {"", "WWN", EKind::kSerials},
-    {"", "DeviceWWN", EKind::kSerials},
-    {"", "PortWWN", EKind::kSerials},
-    {"", "NodeWWN", EKind::kSerials},
-    {"CIM_DiskPartition", "Signature", EKind::kSerials},
-    {"CIM_GPTDiskPartition", "Signature", EKind::kSerials},
+    {"", "SerialNumber", EMeaning::kSerial},
+    {"", "IdentifyingNumber", EMeaning::kSerial},
+    {"", "AssetTag", EMeaning::kSerial},
+    {"", "UserTracking", EMeaning::kSerial},
+    {"", "UUID", EMeaning::kSerial},
+    {"", "GUID", EMeaning::kSerial},
+    {"", "ContentUUID", EMeaning::kSerial},
+    {"", "TableUUID", EMeaning::kSerial},
+    {"", "EntryUUID", EMeaning::kSerial},
+    {"", "MachineID", EMeaning::kSerial},
+    {"", "WWN", EMeaning::kSerial},
+    {"", "DeviceWWN", EMeaning::kSerial},
+    {"", "PortWWN", EMeaning::kSerial},
+    {"", "NodeWWN", EMeaning::kSerial},
+    {"CIM_DiskPartition", "Signature", EMeaning::kSerial},
+    {"CIM_GPTDiskPartition", "Signature", EMeaning::kSerial},
 
-    {"CIM_System", "Name", EKind::kHosts},
-    {"CIM_ComputerSystem", "Name", EKind::kHosts},
-    {"QRVSG_ComputerSystem", "Name", EKind::kHosts},
-    {"", "SystemName", EKind::kHosts},
-    {"", "CSName", EKind::kHosts},
-    {"", "HostName", EKind::kHosts},
-    {"", "Hostname", EKind::kHosts},
-    {"", "DNSHostName", EKind::kHosts},
-    {"", "DomainName", EKind::kHosts},
-    {"", "SearchDomains", EKind::kHosts},
-    {"", "DNSSuffixesToRegister", EKind::kHosts},
+    {"CIM_System", "Name", EMeaning::kHost},
+    {"CIM_ComputerSystem", "Name", EMeaning::kHost},
+    {"QRVSG_ComputerSystem", "Name", EMeaning::kHost},
+    {"", "SystemName", EMeaning::kHost},
+    {"", "CSName", EMeaning::kHost},
+    {"", "HostName", EMeaning::kHost},
+    {"", "Hostname", EMeaning::kHost},
+    {"", "DNSHostName", EMeaning::kHost},
+    {"", "DomainName", EMeaning::kDomain},
+    {"", "SearchDomains", EMeaning::kDomain},
+    {"", "DNSSuffixesToRegister", EMeaning::kDomain},
 
-    {"", "MACAddress", EKind::kAddresses},
-    {"", "PermanentAddress", EKind::kAddresses},
-    {"", "NetworkAddresses", EKind::kAddresses},
-    {"", "PartnerMACAddress", EKind::kAddresses},
-    {"", "BridgeAddress", EKind::kAddresses},
-    {"", "DesignatedBridge", EKind::kAddresses},
-    {"", "DesignatedRoot", EKind::kAddresses},
-    {"", "IPAddress", EKind::kAddresses},
-    {"", "IPv4Address", EKind::kAddresses},
-    {"", "IPv6Address", EKind::kAddresses},
-    {"", "PeerAddress", EKind::kAddresses},
-    {"", "BroadcastAddress", EKind::kAddresses},
-    {"", "Gateway", EKind::kAddresses},
-    {"", "DefaultGateway", EKind::kAddresses},
-    {"", "PreferredSource", EKind::kAddresses},
-    {"", "DestinationAddress", EKind::kAddresses},
-    {"", "DNSServerAddresses", EKind::kAddresses},
-    {"", "ARPTargets", EKind::kAddresses},
-    {"CIM_RemoteServiceAccessPoint", "AccessInfo", EKind::kAddresses},
+    {"", "MACAddress", EMeaning::kAddress},
+    {"", "PermanentAddress", EMeaning::kAddress},
+    {"", "NetworkAddresses", EMeaning::kAddress},
+    {"", "PartnerMACAddress", EMeaning::kAddress},
+    {"", "BridgeAddress", EMeaning::kAddress},
+    {"", "DesignatedBridge", EMeaning::kAddress},
+    {"", "DesignatedRoot", EMeaning::kAddress},
+    {"", "IPAddress", EMeaning::kAddress},
+    {"", "IPv4Address", EMeaning::kAddress},
+    {"", "IPv6Address", EMeaning::kAddress},
+    {"", "PeerAddress", EMeaning::kAddress},
+    {"", "BroadcastAddress", EMeaning::kAddress},
+    {"", "Gateway", EMeaning::kAddress},
+    {"", "DefaultGateway", EMeaning::kAddress},
+    {"", "PreferredSource", EMeaning::kAddress},
+    {"", "DestinationAddress", EMeaning::kAddress},
+    {"", "DNSServerAddresses", EMeaning::kAddress},
+    {"", "ARPTargets", EMeaning::kAddress},
+    {"CIM_RemoteServiceAccessPoint", "AccessInfo", EMeaning::kAddress},
 
-    {"", "UserID", EKind::kUsers},
-    {"", "UserName", EKind::kUsers},
-    {"", "PrimaryOwnerName", EKind::kUsers},
-    {"", "PrimaryOwnerContact", EKind::kUsers},
-    {"CIM_Account", "Name", EKind::kUsers},
-    {"ZEP_ControllerAccount", "Name", EKind::kUsers},
+    {"", "UserID", EMeaning::kUser},
+    {"", "UserName", EMeaning::kUser},
+    {"", "PrimaryOwnerName", EMeaning::kUser},
+    {"", "PrimaryOwnerContact", EMeaning::kUser},
+    {"CIM_Account", "Name", EMeaning::kUser},
+    {"ZEP_ControllerAccount", "Name", EMeaning::kUser},
+
+    {"CIM_RemoteFileSystem", "Name", EMeaning::kSource},
+    {"ZEP_Mount", "Source", EMeaning::kSource},
+    {"ZEP_Mount", "Options", EMeaning::kOptions},
+    {"ZEP_Mount", "FileSystemOptions", EMeaning::kOptions},
+    {"", "KernelCommandLine", EMeaning::kCommandLine},
 };
 
 constexpr std::string_view kFreeTexts[] = {
@@ -115,8 +119,8 @@ constexpr std::string_view kUsualTexts[] = {"not specified",
                                             "false",
                                             "true"};
 
-constexpr std::string_view kUsualUsers[] = {"root",      "admin", "administrator", "user",  "operator",
-                                            "anonymous", "guest", "nobody",        "daemon"};
+constexpr std::string_view kUsualUsers[] = {"root",  "admin",  "administrator", "user", "operator", "anonymous",
+                                            "guest", "nobody", "daemon",        "usb",  "cdrom",    "disk"};  // below /media
 
 // These addresses are the same everywhere: loopback, unspecified, broadcast, netmasks.
 constexpr std::string_view kUsualAddresses[] = {"::1",       "::",        "fe80::",    "ff02::1",        "0.0.0.0",
@@ -153,16 +157,30 @@ bool IsOneCharacter(std::string_view text) {
 
 }  // namespace
 
-std::optional<ESecretKind> KindOfProperty(std::vector<std::string> const& classes, std::string_view property) {
+std::optional<EMeaning> MeaningOfProperty(std::vector<std::string> const& classes, std::string_view property) {
   auto const [first, last] = RowsByProperty().equal_range(property);
   auto const row = std::find_if(first, last, [&](auto const& each) { return IsOf(*each.second, classes); });
-  return row == last ? std::nullopt : std::optional(row->second->fKind);
+  return row == last ? std::nullopt : std::optional(row->second->fMeaning);
 }
 
-std::optional<ESecretKind> KindOfRow(std::string_view key) {
-  if (key == "hostName") return ESecretKind::kHosts;
-  if (key == "serialNumber" || key == "uuid") return ESecretKind::kSerials;
+std::optional<EMeaning> MeaningOfRow(std::string_view key) {
+  if (key == "hostName") return EMeaning::kHost;
+  if (key == "serialNumber" || key == "uuid") return EMeaning::kSerial;
   return std::nullopt;
+}
+
+ESecretKind KindOf(EMeaning meaning) {
+  switch (meaning) {
+    case EMeaning::kSerial:
+      return ESecretKind::kSerials;
+    case EMeaning::kAddress:
+      return ESecretKind::kAddresses;
+    case EMeaning::kUser:
+    case EMeaning::kPassword:
+      return ESecretKind::kUsers;
+    default:
+      return ESecretKind::kHosts;
+  }
 }
 
 bool DescribesSerial(std::string_view description) {

@@ -10,12 +10,28 @@
 
 namespace NQRVZEP20 {
 
-// The kind of secret that a property of a class holds; none if it holds no secret. `classes` is the class of the instance and its
-// superclasses. Some names, such as SerialNumber, are secrets in every class, also in those of unknown plug-ins.
-std::optional<ESecretKind> KindOfProperty(std::vector<std::string> const& classes, std::string_view property);
+// The secret that a value is or contains.
+enum class EMeaning {
+  kSerial,
+  kHost,
+  kDomain,
+  kAddress,
+  kUser,
+  kPassword,
+  kSource,      // of a mount (SettingTexts.h)
+  kOptions,     // of a mount
+  kCommandLine  // of the kernel
+};
+
+// The meaning of a property of a class; none if it holds no secret. `classes` is the class of the instance and its superclasses.
+// Some names, such as SerialNumber, are secrets in every class, also in those of unknown plug-ins.
+std::optional<EMeaning> MeaningOfProperty(std::vector<std::string> const& classes, std::string_view property);
 
 // The same for a row of the identity or the details, by its key: "serialNumber".
-std::optional<ESecretKind> KindOfRow(std::string_view key);
+std::optional<EMeaning> MeaningOfRow(std::string_view key);
+
+// The kind of the secret; of a text with several ones, that of the first.
+ESecretKind KindOf(EMeaning meaning);
 
 // Whether an element of OtherIdentifyingInfo with this description is a serial number: "Serial number", "NAA".
 bool DescribesSerial(std::string_view description);

@@ -16,17 +16,6 @@ using TTexts = std::vector<std::string>;
 constexpr std::size_t kShortestHex = 8, kUuidDigits = 32;
 constexpr std::size_t kShortestBase64 = 6;  // shorter values have forms that are common words
 
-std::string HexOf(std::string_view bytes) {
-  constexpr char digits[] = "0123456789abcdef";
-  std::string hex;
-  for (char const byte : bytes) {
-    auto const number = static_cast<unsigned char>(byte);
-    hex += digits[number >> 4];
-    hex += digits[number & 15];
-  }
-  return hex;
-}
-
 // The digits with a separator after each group: "52:54:00" for a size of 2.
 std::string Grouped(std::string_view digits, std::size_t size, char separator) {
   std::string text;

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/redaction/TSecretIndex.h"
 
-#include "collect/redaction/SecretProperties.h"
 #include "collect/redaction/Spellings.h"
 #include "collect/redaction/TPseudonyms.h"
 #include "collect/redaction/Texts.h"
@@ -53,7 +52,7 @@ bool IsSame(std::string_view text, std::string_view spelling, bool isExact) {
 }  // namespace
 
 void TSecretIndex::Add(ESecretKind kind, std::string const& value) {
-  if (IsPlaceholder(kind, value) || !fValues.insert(value).second) return;
+  if (!fValues.insert(value).second) return;
   std::size_t const secret = fSecrets.size();
   fSecrets.push_back({kind, value});
   bool const isExact = IsLetters(value);

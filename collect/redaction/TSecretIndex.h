@@ -27,7 +27,7 @@ struct TSecret {
 // digit among them, is a spelling of it: "enx525400112201".
 class TSecretIndex {
 public:
-  // A value that is known already, and a placeholder (SecretProperties.h), are ignored.
+  // A value that is known already is ignored.
   void Add(ESecretKind kind, std::string const& value);
 
   std::vector<TSecret> const& Secrets() const { return fSecrets; }

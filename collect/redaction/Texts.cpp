@@ -88,6 +88,17 @@ std::string Lower(std::string_view text) {
 
 bool IsHex(std::string_view text) { return !text.empty() && std::all_of(text.begin(), text.end(), IsHexDigit); }
 
+std::string HexOf(std::string_view bytes) {
+  constexpr char digits[] = "0123456789abcdef";
+  std::string hex;
+  for (char const byte : bytes) {
+    auto const number = static_cast<unsigned char>(byte);
+    hex += digits[number >> 4];
+    hex += digits[number & 15];
+  }
+  return hex;
+}
+
 std::size_t SizeOfWordCharacter(std::string_view text, std::size_t at) {
   if (at >= text.size()) return 0;
   if (static_cast<unsigned char>(text[at]) < 0x80) return IsLetterOrDigit(text[at]) ? 1 : 0;
@@ -173,12 +184,29 @@ std::vector<std::string> UuidsIn(std::string_view text) {
 }
 
 std::vector<std::string> HomesIn(std::string_view text) {
-  constexpr std::string_view home = "/home/";
+  constexpr std::string_view home = "/home/", media = "/media/";
   std::vector<std::string> names;
-  for (std::size_t at = 0; (at = text.find(home, at)) != text.npos;) {
-    at += home.size();
-    std::size_t const end = EndOfName(text, at);
-    if (end > at) names.emplace_back(text.substr(at, end - at));
+  for (std::string_view const parent : {home, media})
+    for (std::size_t at = 0; (at = text.find(parent, at)) != text.npos;) {
+      at += parent.size();
+      std::size_t const end = EndOfName(text, at);
+      bool const isHome = parent == home || (end < text.size() && text[end] == '/');
+      if (end > at && isHome) names.emplace_back(text.substr(at, end - at));
+    }
+  return names;
+}
+
+std::vector<std::string> IscsiNamesIn(std::string_view text) {
+  constexpr std::string_view begin = "iqn.", unit = "-lun-";
+  std::vector<std::string> names;
+  for (std::size_t at = 0; (at = text.find(begin, at)) != text.npos;) {
+    std::size_t end = at + begin.size();
+    while (end < text.size() && (IsLetterOrDigit(text[end]) || text[end] == '.' || text[end] == ':' || text[end] == '-')) ++end;
+    std::string_view name = text.substr(at, end - at);
+    name = name.substr(0, name.find(unit));
+    while (!IsLetterOrDigit(name.back())) name.remove_suffix(1);
+    if (name.size() > begin.size() && IsWordBound(text, at, at + name.size())) names.emplace_back(name);
+    at = end;
   }
   return names;
 }

@@ -25,6 +25,9 @@ std::string Lower(std::string_view text);
 // Whether it consists of hexadecimal digits; an empty text does not.
 bool IsHex(std::string_view text);
 
+// The bytes as hexadecimal digits in lower case.
+std::string HexOf(std::string_view bytes);
+
 // The words alone: "525400112201" for "52:54:00:11:22:01".
 std::string Compact(std::string_view text);
 
@@ -47,7 +50,11 @@ std::vector<std::string> AddressesIn(std::string_view text, bool withIPv4);
 // everywhere, after a hyphen; that one is omitted.
 std::vector<std::string> UuidsIn(std::string_view text);
 
-// The names of home directories in a text: "alice" for "/home/alice/bin".
+// The names of home directories in a text, and of the directories in which desktops mount the media of a user: "alice" for
+// "/home/alice/bin" and "/run/media/alice/STICK".
 std::vector<std::string> HomesIn(std::string_view text);
+
+// The names of iSCSI initiators and targets in a text: "iqn.2026-01.net.example:disk1".
+std::vector<std::string> IscsiNamesIn(std::string_view text);
 
 }  // namespace NQRVZEP20

@@ -1,45 +1,13 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/redaction/Redaction.h"
 
-#include "collect/stored/StoredDocument.h"
-#include "tests/collect/stored/StoredDocument.h"
+#include "tests/collect/redaction/ReportDocument.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
 namespace NQRVZEP20 {
 namespace {
-
-using TJson = nlohmann::ordered_json;
-
-std::vector<ESecretKind> AllKinds() { return {kSecretKinds.begin(), kSecretKinds.end()}; }
-
-TJson PropertyOf(std::string const& type, TJson const& value) { return {{"type", type}, {"value", value}, {"source", "test"}}; }
-
-TJson InstanceOf(std::string const& className, TJson const& properties) {
-  return {{"path", "root/x:" + className + ".Tag=\"1\""},
-          {"provider", "X"},
-          {"namespace", "root/x"},
-          {"class", className},
-          {"properties", properties}};
-}
-
-// A document with one instance more.
-TJson DocumentWith(TJson const& instance) {
-  TJson document = TJson::parse(StoredDocument());
-  document["instances"].push_back(instance);
-  return document;
-}
-
-TJson DocumentWith(std::string const& property, TJson const& value) {
-  return DocumentWith(InstanceOf("X_Thing", {{property, PropertyOf(value.is_array() ? "string[]" : "string", value)}}));
-}
-
-std::string Redacted(TJson document, std::vector<ESecretKind> const& kinds = AllKinds()) {
-  TPseudonyms pseudonyms("1");
-  Redact(document, kinds, pseudonyms);
-  return document.dump();
-}
 
 TEST(RedactionTest, ThePropertyDecidesAndItsValueIsReplacedEverywhere) {
   TJson document = DocumentWith("SerialNumber", "ZX81-77");
@@ -48,60 +16,6 @@ TEST(RedactionTest, ThePropertyDecidesAndItsValueIsReplacedEverywhere) {
   EXPECT_THAT(text, testing::Not(testing::HasSubstr("ZX81")));
   EXPECT_THAT(text, testing::HasSubstr("the machine with the number serial-"));
   EXPECT_THAT(text, testing::ContainsRegex("by-id/x_serial-[0-9]+-part1"));
-}
-
-TEST(RedactionTest, EachKindOfPropertyHasItsPseudonym) {
-  struct TRow {
-    char const *fProperty, *fValue, *fPseudonym;
-  };
-  TRow const rows[] = {
-      {"UUID", "3F2A9C54-11D0-4B8E-9A7E-52540011AA01", "serial-"},
-      {"AssetTag", "RACK5-C", "serial-"},
-      {"SystemName", "build7.example.net", "host-"},
-      {"SearchDomains", "lab.example.net", "host-"},
-      {"PermanentAddress", "525400112202", "address-"},
-      {"IPv4Address", "192.0.2.77", "address-"},
-      {"IPv6Address", "2001:db8::77", "address-"},
-      {"AccessInfo", "192.0.2.78", ""},
-      {"UserID", "mallory", "user-"},
-      {"SystemName", "192.0.2.79", "address-"},
-      {"Colour", "ZX81-77", ""},
-  };
-  for (TRow const& row : rows) {
-    SCOPED_TRACE(row.fProperty);
-    std::string const text = Redacted(DocumentWith(row.fProperty, row.fValue));
-    bool const isSecret = *row.fPseudonym != '\0';
-    EXPECT_EQ(text.find(row.fValue) == text.npos, isSecret);
-    if (isSecret) {
-      EXPECT_THAT(text, testing::HasSubstr(std::string("\"value\":\"") + row.fPseudonym));
-    }
-  }
-}
-
-TEST(RedactionTest, AClassInheritsThePropertiesOfItsSuperclasses) {
-  TJson document = DocumentWith(InstanceOf("X_Rack", {{"Name", PropertyOf("string", "rack-row-9")}}));
-  EXPECT_THAT(Redacted(document), testing::HasSubstr("rack-row-9"));
-  document["classes"] = TJson::array({{{"class", "X_Rack"}, {"superclasses", {"X_Base", "CIM_System"}}}});
-  EXPECT_THAT(Redacted(document), testing::Not(testing::HasSubstr("rack-row-9")));
-}
-
-TEST(RedactionTest, ADescriptionMakesIdentifyingInfoASerialNumber) {
-  std::string const text = Redacted(
-      DocumentWith(InstanceOf("X_Disk", {{"OtherIdentifyingInfo", PropertyOf("string[]", {"QM-0001", "QEMU DISK"})},
-                                         {"IdentifyingDescriptions", PropertyOf("string[]", {"Serial number", "Product"})}})));
-  EXPECT_THAT(text, testing::Not(testing::HasSubstr("QM-0001")));
-  EXPECT_THAT(text, testing::HasSubstr("QEMU DISK"));
-}
-
-TEST(RedactionTest, PlaceholdersRemain) {
-  for (char const* value : {"Not Specified", "To Be Filled By O.E.M.", "0", "00000000", "XXXXXXX", "x", "0000:00:1f.2", ""}) {
-    std::string const text = Redacted(DocumentWith("SerialNumber", value));
-    EXPECT_THAT(text, testing::HasSubstr("\"value\":\"" + std::string(value) + "\"")) << value;
-  }
-  for (char const* value : {"127.0.0.1", "::1", "0.0.0.0", "255.255.255.0", "::"})
-    EXPECT_THAT(Redacted(DocumentWith("IPAddress", value)), testing::HasSubstr("\"value\":\"" + std::string(value) + "\""))
-        << value;
-  EXPECT_THAT(Redacted(DocumentWith("UserID", "root")), testing::HasSubstr("\"value\":\"root\""));
 }
 
 TEST(RedactionTest, OnlyTheKindsThatAreWantedAreReplaced) {
@@ -113,20 +27,16 @@ TEST(RedactionTest, OnlyTheKindsThatAreWantedAreReplaced) {
   EXPECT_THAT(text, testing::HasSubstr(R"("redaction":{"kinds":["users"],"map":"1"})"));
 }
 
-TEST(RedactionTest, AddressesInFreeTextAreFoundByTheirShape) {
-  TJson const document = DocumentWith(InstanceOf(
-      "X_Log",
-      {{"Message", PropertyOf("string", "eth0: martian source 198.51.100.7 from 52:54:00:ab:cd:ef, fe80::9, at 10:20:30")},
-       {"Version", PropertyOf("string", "198.51.100.8")}}));
-  std::string const text = Redacted(document);
-  EXPECT_THAT(text, testing::ContainsRegex("source address-[0-9]+ from address-[0-9]+, address-[0-9]+, at 10:20:30"));
-  EXPECT_THAT(text, testing::HasSubstr("198.51.100.8")) << "may be a version";
-}
-
-TEST(RedactionTest, AUserIsFoundByTheHomeDirectory) {
-  TJson document = TJson::parse(StoredDocument());
-  document["plugInDirectory"] = "/home/mallory/zep/lib";
-  EXPECT_THAT(Redacted(document), testing::HasSubstr("/home/user-1/zep/lib"));
+// Of a MAC address or a GUID, for example.
+TEST(RedactionTest, BytesAreFoundAsHexadecimalDigits) {
+  TJson document = DocumentWith(InstanceOf("X_Port", {{"MACAddress", PropertyOf("uint8[]", {82, 84, 0, 171, 205, 239})}}));
+  document["head"] = {"525400abcdef and enx525400abcdef"};
+  TJson redacted = document;
+  TPseudonyms pseudonyms("1");
+  Redact(redacted, AllKinds(), pseudonyms);
+  EXPECT_THAT(redacted.dump(), testing::Not(testing::HasSubstr("525400abcdef")));
+  Unredact(redacted, pseudonyms);
+  EXPECT_EQ(redacted, document);
 }
 
 TEST(RedactionTest, ASecretBesideSpacesAndQuotesOfUnicodeIsFound) {
@@ -226,48 +136,6 @@ TEST(RedactionTest, AnotherMapAndAnUnknownPseudonymAreRefusedByPlace) {
   EXPECT_EQ(whyRefused(document, pseudonyms), "/head/1: serial-99 is not in the map");
 }
 
-TEST(RedactionTest, CountsTheSecretsOfEachKind) {
-  TJson const before = TJson::parse(StoredDocument());
-  TSecretCounts counts = CountSecrets(before);
-  ++counts[0];
-  ++counts[3];
-  TJson const document = DocumentWith(
-      InstanceOf("X_Thing", {{"SerialNumber", PropertyOf("string", "ZX81-77")}, {"UserID", PropertyOf("string", "mallory")}}));
-  EXPECT_EQ(CountSecrets(document), counts);
-}
-
-TEST(RedactionTest, AddressesAreFoundInEveryNotationOfAMessage) {
-  TJson document = DocumentWith("Message",
-                                "ip=192.0.2.5:192.0.2.1 to 192.0.2.77:8080, 192.0.2.80-192.0.2.90, eth0:192.0.2.91, "
-                                "MAC=52:54:00:aa:bb:01:52:54:00:aa:bb:02:08:00, "
-                                "root=UUID=0a1b2c3d-1111-2222-3333-444455556666");
-  std::string const text = Redacted(document);
-  for (char const* secret : {"192.0.2.", "aa:bb:01", "aa:bb:02", "0a1b2c3d"})
-    EXPECT_THAT(text, testing::Not(testing::HasSubstr(secret))) << secret;
-}
-
-TEST(RedactionTest, OfAUrlTheHostIsASecretAndOfAnAddressNotThePort) {
-  TJson const service = {{"AccessInfo", PropertyOf("string", "https://bmc77.example:8443/redfish")}};
-  TJson document = DocumentWith(InstanceOf("CIM_RemoteServiceAccessPoint", service));
-  document["head"][0] = "bmc77.example answers";
-  std::string const text = Redacted(document);
-  EXPECT_THAT(text, testing::Not(testing::HasSubstr("bmc77")));
-  EXPECT_THAT(text, testing::ContainsRegex("https://address-[0-9]+:8443/redfish"));
-}
-
-TEST(RedactionTest, TheFirstLabelOfADomainIsAWord) {
-  TJson document = DocumentWith("SearchDomains", TJson::array({"dev.example.com"}));
-  document["head"][0] = "/dev/sda of dev.example.com";
-  EXPECT_THAT(Redacted(document), testing::ContainsRegex("/dev/sda of host-[0-9]+\""));
-}
-
-TEST(RedactionTest, TheIdentifierOfAVolumeGroupIsASerial) {
-  std::string const id = "jY6etWf0aBcDeFgHiJkLmNoPqRsTuVwX";
-  TJson document = DocumentWith("InstanceID", "ZEP:pool:" + id);
-  document["head"][0] = "LVM-" + id + "0123456789abcdefghijklmnopqrstuv";
-  EXPECT_THAT(Redacted(document), testing::Not(testing::HasSubstr(id)));
-}
-
 TEST(RedactionTest, OnlyAnObjectPathHidesItsClass) {
   TJson document = DocumentWith("SerialNumber", "ZX81-77");
   document["head"][0] = "root/x:ZX81-77 failed";
@@ -278,13 +146,6 @@ TEST(RedactionTest, APropertyMayHaveTheNameOfAMember) {
   TJson document = DocumentWith(InstanceOf(
       "X_Thing", {{"SerialNumber", PropertyOf("string", "ZX81-77")}, {"thresholds", PropertyOf("string", "of ZX81-77")}}));
   EXPECT_THAT(Redacted(document), testing::Not(testing::HasSubstr("ZX81")));
-}
-
-TEST(RedactionTest, DescriptionsMayHaveAnotherForm) {
-  TJson document =
-      DocumentWith(InstanceOf("X_Thing", {{"OtherIdentifyingInfo", PropertyOf("string[]", TJson::array({"ZX81-77"}))},
-                                          {"IdentifyingDescriptions", PropertyOf("string", "Serial")}}));
-  EXPECT_THAT(Redacted(document), testing::HasSubstr("ZX81-77"));
 }
 
 TEST(RedactionTest, TheResultOfSendingIsNotOfTheRedaction) {
