@@ -7,6 +7,7 @@
 // Of each function, two calls fail, spread over the run; ZEP_FAULT_CALLS=NUMBER sets how many (scripts/faults).
 
 #include "tests/Support.h"
+#include "tests/tools/zep/bundle/Certificates.h"
 
 #include <fcntl.h>
 #include <sys/prctl.h>
@@ -49,6 +50,8 @@ TCommand const kCommands[] = {
     {"Unredact", {"unredact", "redacted.json", "--map", "its-map", "--json"}, EOutput::kDocument},
     {"Record", {"record", "new.rec", "--json"}, EOutput::kDocument, "new.rec", true},
     {"Replay", {"report", "--replay", "stored.rec", "--json"}, EOutput::kDocument},
+    {"Bundle", {"report", "--bundle", "new.bundle", "--sign", "key", "--json"}, EOutput::kDocument, "new.bundle", true},
+    {"Verify", {"verify", "stored.bundle", "--signer", "key", "--json"}, EOutput::kDocument},
     {"Diff", {"diff", "stored.json", "stored.json", "--json"}, EOutput::kDocument},
     {"Show", {"show", "--sample", "CIM_Chassis", "--json"}, EOutput::kDocument},
     {"Mof", {"mof", "schema.mof", "--json"}, EOutput::kDocument},
@@ -208,11 +211,18 @@ void ExpectWholePage(TEnd const& end) {
   EXPECT_NE(end.fMade.find("</html>"), std::string::npos);
 }
 
+void ExpectWholeBundle(TEnd const& end) {
+  if (end.fFiles.count("new.bundle") == 0) return;
+  TEnd const check = EndOf({"", {"verify", "new.bundle"}, EOutput::kText}, "", {{"new.bundle", end.fMade}});
+  EXPECT_EQ(check.fStatus, 0) << check.fOutput << check.fErrors;
+}
+
 void ExpectGoodEnd(TCommand const& command, TEnd const& end, TFault const& fault, TEnd const& usual) {
   static std::set<int> const documented = {0, 1, 2, 64, 66, 68, 69, 73, 75};
   if (fault.fError == -SIGKILL) {
     EXPECT_TRUE(end.fStatus == -SIGKILL || documented.count(end.fStatus) != 0) << end.fStatus;
     ExpectWholePage(end);
+    ExpectWholeBundle(end);
     return;
   }
   // libgcrypt ends a program without /proc, and libarchive one without memory.
@@ -233,11 +243,22 @@ void ExpectGoodEnd(TCommand const& command, TEnd const& end, TFault const& fault
   ExpectWholePage(end);
 }
 
-// A report, the same redacted with its map, and a recording.
+// A private key with its certificate.
+std::string SigningKey() {
+  TTempDir const dir;
+  zep::TIdentity const identity(dir, "alice");
+  return ReadFile(identity.fCertificateFile) + ReadFile(identity.fKeyFile);
+}
+
+// A report, the same redacted with its map, a recording, and a signed bundle with its key.
 TInputs MakeInputs() {
   TEnd const redacted =
       EndOf({"", {"report", "--sample", "--redact", "--redaction-map", "map", "--json"}, EOutput::kDocument, "map"}, "", {});
-  return {{"stored.json", EndOf(kCommands[1], "", {}).fOutput},
+  std::string const key = SigningKey();
+  TWords const bundle = {"report", "--sample", "--bundle", "new.bundle", "--sign", "key"};
+  return {{"key", key},
+          {"stored.bundle", EndOf({"", bundle, EOutput::kText, "new.bundle"}, "", {{"key", key}}).fMade},
+          {"stored.json", EndOf(kCommands[1], "", {}).fOutput},
           {"redacted.json", redacted.fOutput},
           {"its-map", redacted.fMade},
           {"stored.rec", ReadFile(SourcePath("fuzz/seeds/Recording/small.rec"))}};

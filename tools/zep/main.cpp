@@ -51,6 +51,7 @@ constexpr TCommand kCommands[] = {
     {"get", "Fetch a file from an FTP or SFTP server", AddGetArguments},
     {"proxy-check", "Check whether a web proxy lets requests through", AddProxyCheckArguments},
     {"unredact", "Print the original of a redacted report", AddUnredactArguments},
+    {"verify", "Check a bundle of zep report, and who signed it", AddVerifyArguments},
     {"wpad", "Find the proxy configuration file that the DHCP server names", AddWpadArguments},
     {"help", "List the commands, or describe one", AddHelpArguments},
 };

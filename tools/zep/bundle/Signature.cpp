@@ -66,7 +66,8 @@ TReason TakeReason() {
 
 TBio BioOf(std::string_view bytes) {
   if (bytes.size() > INT_MAX) throw std::bad_alloc();
-  return OrNoMemory(TBio(BIO_new_mem_buf(bytes.data(), static_cast<int>(bytes.size()))));
+  char const* const begin = bytes.empty() ? "" : bytes.data();  // OpenSSL accepts no null pointer
+  return OrNoMemory(TBio(BIO_new_mem_buf(begin, static_cast<int>(bytes.size()))));
 }
 
 [[noreturn]] void Refuse(std::string const& name, std::string const& why) { throw TFailure(kExitNoInput, name + " " + why); }

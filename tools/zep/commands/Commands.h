@@ -46,6 +46,7 @@ TRun AddRunArguments(CLI::App& command);         // RunCommand.cpp
 TRun AddSendArguments(CLI::App& command);        // SendCommand.cpp
 TRun AddShowArguments(CLI::App& command);        // ShowCommand.cpp
 TRun AddUnredactArguments(CLI::App& command);    // UnredactCommand.cpp
+TRun AddVerifyArguments(CLI::App& command);      // VerifyCommand.cpp
 TRun AddWpadArguments(CLI::App& command);        // WpadCommand.cpp
 
 // The subcommand of that name, which `app` owns, or null (HelpCommand.cpp).

@@ -87,6 +87,7 @@ void AddReportOptions(CLI::App& command, TReportArguments& arguments) {
   AddRedactionOptions(command, arguments.fRedaction);
   AddPlugInOptions(command, arguments.fPlugIns);
   AddStoredOptions(command, arguments);
+  AddBundleOptions(command, arguments.fBundle);
 }
 
 }  // namespace NQRVZEP20::zep

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "tools/zep/commands/Bundling.h"
 #include "tools/zep/commands/Providers.h"
 #include "tools/zep/commands/Redacting.h"
 #include "tools/zep/output/ReportText.h"
@@ -33,7 +34,8 @@ struct TReportArguments {
   std::string fSince;         // a stored report to compare with; empty for none
   std::string fReplay;        // a recording; empty for this machine
   std::string fHtmlFile;      // the page to write; empty for none
-  std::string fMedium;        // the device to write to; empty for standard output
+  TBundleArguments fBundle;
+  std::string fMedium;  // the device to write to; empty for standard output
 };
 
 // Adds the options of zep report, which set `arguments`; those outlive the command.

@@ -28,17 +28,26 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
+// Writes the bundle of a stored report, and prints what it has unless the document is printed.
+void BundleFrom(TJson const& document, TReportArguments const& arguments) {
+  TBundleManifest const manifest = WriteBundle(arguments.fBundle, AsVerbatimText(document), EvidenceOfStored());
+  if (!arguments.fAsJson) WriteMessage(TextAbout(manifest, arguments.fBundle));
+}
+
 int ReportFrom(TReportArguments const& arguments) {
-  if (!arguments.fAsJson) {
+  if (!arguments.fAsJson && !arguments.fBundle.IsWanted()) {
     TStoredReport const report = ReadReport(arguments.fFrom, arguments.fRedaction);
     PrintOrWritePage(report, arguments.fHtmlFile);
     return StatusOf(report);
   }
-  if (!arguments.fRedaction.IsWanted()) throw TWrongUsage("--from and --json exclude each other without --redact");
+  if (arguments.fAsJson && !arguments.fRedaction.IsWanted())
+    throw TWrongUsage("--from and --json exclude each other without --redact");
+  CheckSigning(arguments.fBundle);
   TJson const document = ReadDocument(arguments.fFrom, arguments.fRedaction);
   TStoredReport const report = StoredReportOf(document, arguments.fFrom);
   if (!arguments.fHtmlFile.empty()) PrintOrWritePage(report, arguments.fHtmlFile);
-  WriteOutput(AsVerbatimText(document));
+  if (arguments.fBundle.IsWanted()) BundleFrom(document, arguments);
+  if (arguments.fAsJson) WriteOutput(AsVerbatimText(document));
   return StatusOf(report);
 }
 
@@ -62,23 +71,33 @@ TReport ReportOn(TReplay const& replay, TReportArguments const& arguments) {
   return report;
 }
 
+// Why the bundle of the report shall have no recording; empty if it shall have one.
+std::string WhyNoRecording(TReportArguments const& arguments) {
+  if (arguments.fSample) return "the report is on the sample, which is not a machine";
+  return arguments.fRedaction.IsWanted() ? "it has the secrets that the other pieces have pseudonyms for" : "";
+}
+
 // Prints the message of an interrupted run itself: the signal ends zep when `guard` ends.
 int Report(TReportArguments const& arguments) {
   std::optional<TSample> sample;
   std::optional<TInterruptGuard> guard;
-  std::optional<TReplay> replay;  // ends before the guard, because the signal then ends zep
+  std::optional<TReplay> replay;  // both end before the guard, because the signal then ends zep
+  std::optional<TEvidenceReading> reading;
   try {
     if (arguments.fFormat == kJsonLines && !arguments.fMedium.empty())
       throw TWrongUsage("--format jsonl and --to-media exclude each other");
     TTarget const target = arguments.fTarget.empty() ? TTarget{} : TargetOf(arguments.fTarget, arguments.fBySftp);
     if (!arguments.fMedium.empty()) CheckDevice(arguments.fMedium);
-    if (!arguments.fReplay.empty()) {
-      guard.emplace();
-      replay.emplace(arguments.fReplay);
-    }
+    CheckSigning(arguments.fBundle);
+    if (!arguments.fReplay.empty() || arguments.fBundle.IsWanted()) guard.emplace();
+    if (!arguments.fReplay.empty()) replay.emplace(arguments.fReplay);
+    if (arguments.fBundle.IsWanted()) reading.emplace(arguments.fReplay, WhyNoRecording(arguments));
     sample = SampleIf(arguments.fSample);
     TReport report = replay ? ReportOn(*replay, arguments) : ReportHere(sample, arguments);
-    return Deliver(TMadeReport(std::move(report), arguments.fRedaction), target, arguments, guard);
+    TEvidence evidence = reading ? reading->Finish(report.fPlugIns) : TEvidence();
+    TMadeReport const made(std::move(report), arguments.fRedaction, evidence.fLog.value_or(""));
+    if (evidence.fLog) evidence.fLog = made.Log();
+    return Deliver(made, evidence, target, arguments, guard);
   } catch (std::exception const& failure) {
     bool const isOfMedium = !arguments.fMedium.empty() && arguments.fAsJson && !HasWrittenOutput();
     if (isOfMedium) WriteOutput(FailureAsJson(kToMedia, StatusOf(failure), failure.what(), sample ? sample->fLabel : ""));
@@ -97,8 +116,9 @@ TRun AddReportArguments(CLI::App& command) {
       "Exit status: 0 when the identity is complete, even if details are missing, 2 when part of the identity is missing or\n"
       "a plug-in failed, 3 when a finding is as severe as --fail-on says or worse, 1 when none of it is known or the medium\n"
       "could not be mounted, written or unmounted, 64 for wrong usage; when the report could not be sent, the exit status\n"
-      "of zep send. With --from it is that of the stored report, with --since that of zep diff; 66 when the stored report\n"
-      "or the recording is refused, 73 when the page cannot be written.");
+      "of zep send; 2 when a bundle lacks a recording that could not be made. With --from it is that of the stored report,\n"
+      "with --since that of zep diff; 66 when the stored report, the recording, or the key of --sign is refused, 73 when the\n"
+      "page or the bundle cannot be written.");
   return [arguments] {
     if (!arguments->fFrom.empty()) return ReportFrom(*arguments);
     return arguments->fSince.empty() ? Report(*arguments) : ReportSince(*arguments);

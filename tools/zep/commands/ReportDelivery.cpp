@@ -73,7 +73,7 @@ TJson WriteToMedium(TMadeReport const& made, TReportArguments const& arguments) 
 TReportDocument PrintOrWrite(TMadeReport const& made, TReportArguments const& arguments) {
   if (!arguments.fMedium.empty()) return TReportDocument(WriteToMedium(made, arguments));
   if (arguments.fAsJson) return made.Document(EMessages::kWithoutSecrets);
-  if (arguments.fHtmlFile.empty()) WriteOutput(made.Text(arguments.fParts));
+  if (arguments.fHtmlFile.empty() && !arguments.fBundle.IsWanted()) WriteOutput(made.Text(arguments.fParts));
   return TReportDocument(TJson());
 }
 
@@ -87,6 +87,12 @@ std::optional<TFailure> WritePage(TMadeReport const& made, TReportArguments cons
     if (arguments.fTarget.empty()) throw;
     return failure;
   }
+}
+
+void WriteBundleOf(TMadeReport const& made, TEvidence const& evidence, TReportArguments const& arguments) {
+  std::string const document = made.Document(EMessages::kWithoutSecrets).Text();
+  TBundleManifest const manifest = WriteBundle(arguments.fBundle, document, evidence);
+  if (!arguments.fAsJson) WriteMessage(TextAbout(manifest, arguments.fBundle));
 }
 
 void PrintNumberOfSecrets(TReport const& report, TReportArguments const& arguments) {
@@ -141,12 +147,13 @@ EExitStatus Send(TMadeReport const& made, TTarget const& target, TReportArgument
 
 }  // namespace
 
-int Deliver(TMadeReport const& made, TTarget const& target, TReportArguments const& arguments,
+int Deliver(TMadeReport const& made, TEvidence const& evidence, TTarget const& target, TReportArguments const& arguments,
             std::optional<TInterruptGuard>& guard) {
   TReport const& report = made.Report();
   EExitStatus status = ExitStatusOf(report.fCompleteness);
   if (!arguments.fMedium.empty() && !guard) guard.emplace();
   auto const pageFailure = WritePage(made, arguments);
+  if (arguments.fBundle.IsWanted()) WriteBundleOf(made, evidence, arguments);
   TReportDocument document = PrintOrWrite(made, arguments);
   if (!arguments.fTarget.empty()) {
     if (!guard) guard.emplace();
@@ -155,6 +162,8 @@ int Deliver(TMadeReport const& made, TTarget const& target, TReportArguments con
   }
   bool const isDelivered = status == kExitComplete || status == kExitPartial;
   if (pageFailure) std::cerr << "zep: " << Printable(pageFailure->what()) << "\n";
+  if (status == kExitComplete && !evidence.fFailure.empty())
+    SetOutcome(document.Members(), status = kExitPartial, evidence.fFailure);
   if (pageFailure && isDelivered)
     SetOutcome(document.Members(), status = pageFailure->fStatus, pageFailure->what());
   else if (isDelivered && FailsBecauseOfFindings(report, arguments))

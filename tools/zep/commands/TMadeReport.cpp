@@ -5,11 +5,23 @@
 
 namespace NQRVZEP20::zep {
 
-TMadeReport::TMadeReport(TReport report, TRedactionArguments const& redaction) : fReport(std::move(report)) {
+namespace {
+
+// The member of the document that has the log while it is redacted: as a message (Redaction.h), and with the secrets of the
+// report.
+constexpr char const* kLog = "words";
+
+}  // namespace
+
+TMadeReport::TMadeReport(TReport report, TRedactionArguments const& redaction, std::string log)
+    : fReport(std::move(report)), fLog(std::move(log)) {
   if (!redaction.IsWanted()) return;
   TReportDocument document(fReport, EMessages::kVerbatim);
   document.ReadInstances();
+  document.Members()[kLog] = std::move(fLog);
   RedactDocument(document.Members(), redaction);
+  fLog = document.Members()[kLog].get<std::string>();
+  document.Members().erase(kLog);
   fRedacted = std::move(document.Members());
 }
 

@@ -16,19 +16,22 @@ namespace NQRVZEP20::zep {
 // redacted document.
 class TMadeReport {
 public:
-  // Redacts the report if that is wanted (RedactDocument).
-  TMadeReport(TReport report, TRedactionArguments const& redaction);
+  // Redacts the report, and its log, if that is wanted (RedactDocument).
+  TMadeReport(TReport report, TRedactionArguments const& redaction, std::string log = "");
 
   TReport const& Report() const { return fReport; }
 
   TReportDocument Document(EMessages messages) const;
   std::string Text(TReportParts const& parts) const;
 
+  std::string const& Log() const { return fLog; }
+
   // The report as it would be read back from its document.
   TStoredReport Stored() const;
 
 private:
   TReport fReport;
+  std::string fLog;
   std::optional<TJson> fRedacted;
 };
 
