@@ -1,11 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/redaction/Spellings.h"
 
+#include "collect/redaction/TNormalText.h"
 #include "collect/redaction/Texts.h"
 
 #include <arpa/inet.h>
-
-#include <algorithm>
 
 namespace NQRVZEP20 {
 
@@ -16,11 +15,11 @@ using TTexts = std::vector<std::string>;
 constexpr std::size_t kShortestHex = 8, kUuidDigits = 32;
 constexpr std::size_t kShortestBase64 = 6;  // shorter values have forms that are common words
 
-// The digits with a separator after each group: "52:54:00" for a size of 2.
-std::string Grouped(std::string_view digits, std::size_t size, char separator) {
+// The digits with a mark after each group: "52-54-00" for a size of 2.
+std::string Grouped(std::string_view digits, std::size_t size) {
   std::string text;
   for (std::size_t at = 0; at < digits.size(); at += size) {
-    if (at > 0) text += separator;
+    if (at > 0) text += '-';
     text += digits.substr(at, size);
   }
   return text;
@@ -39,15 +38,16 @@ std::string Reversed(std::string_view digits) {
   return reversed;
 }
 
+// The digits, also in groups of one and two bytes.
 void AddHex(TTexts& texts, std::string const& digits) {
   texts.push_back(digits);
   texts.push_back("0x" + digits);
-  for (char const separator : {':', '-', ' '}) texts.push_back(Grouped(digits, 2, separator));
-  texts.push_back(Grouped(digits, 4, '.'));
+  texts.push_back(Grouped(digits, 2));
+  texts.push_back(Grouped(digits, 4));
 }
 
 void AddUuid(TTexts& texts, std::string const& digits) {
-  texts.push_back(Grouped(digits, 8, ':'));
+  texts.push_back(Grouped(digits, 8));
   for (std::string const& order :
        {digits,
         Reversed(digits.substr(0, 8)) + Reversed(digits.substr(8, 4)) + Reversed(digits.substr(12, 4)) + digits.substr(16),
@@ -68,17 +68,16 @@ void AddAddress(TTexts& texts, std::string const& value) {
   } else if (::inet_pton(AF_INET6, value.c_str(), &bytes) == 1) {
     std::string const digits = HexOf({reinterpret_cast<char const*>(&bytes), sizeof bytes});
     texts.push_back(digits);
-    texts.push_back(Grouped(digits, 4, ':'));
+    texts.push_back(Grouped(digits, 4));
     texts.emplace_back(::inet_ntop(AF_INET6, &bytes, notation, sizeof notation));
   }
 }
 
-std::string Utf16(std::string_view value, bool isBigEndian) {
+std::string Utf16(std::string_view value) {
   std::string text;
   for (char const byte : value) {
-    if (isBigEndian) text += '\0';
     text += byte;
-    if (!isBigEndian) text += '\0';
+    text += '\0';
   }
   return text;
 }
@@ -98,48 +97,55 @@ std::string Base64(std::string_view value, std::size_t skipped) {
   return text;
 }
 
+// Letters beyond ASCII, which are a character each, become two marks and more.
 std::string PercentEncoded(std::string_view value) {
   std::string text;
   for (char const byte : value) text += IsLetterOrDigit(byte) ? std::string(1, byte) : "%" + HexOf({&byte, 1});
   return text;
 }
 
-std::string WithEscapes(std::string_view value) {
-  std::string text;
-  for (char const byte : value) {
-    if (byte == '"' || byte == '\\') text += '\\';
-    text += byte;
-  }
-  return text;
+// "5000c500a1b2c3d4" of "naa.5000c500a1b2c3d4" and "wwn-0x5000c500a1b2c3d4"
+std::string_view WithoutPrefix(std::string_view value) {
+  for (std::string_view const prefix : {"wwn-", "naa.", "eui.", "0x"})
+    if (Lower(value.substr(0, prefix.size())) == prefix) value.remove_prefix(prefix.size());
+  return value;
 }
 
-void AddEncodings(TTexts& texts, std::string_view value) {
-  std::string const hex = HexOf(value);
-  AddHex(texts, hex);
-  texts.push_back(HexOf(Utf16(value, false)));
-  texts.push_back(Utf16(value, false));
-  texts.push_back(Utf16(value, true));
-  if (value.size() >= kShortestBase64)
-    for (std::size_t skipped = 0; skipped < 3; ++skipped) texts.push_back(Base64(value, skipped));
-  texts.push_back(PercentEncoded(value));
-  texts.push_back(WithEscapes(value));
+// The hexadecimal digits of an identifier; empty if the value is none.
+std::string DigitsOf(std::string_view value) {
+  std::string digits = Lower(Compact(WithoutPrefix(value)));
+  bool const isIdentifier = IsHex(digits) && digits.size() >= kShortestHex && digits.size() % 2 == 0 && !IsIPv4(value);
+  return isIdentifier ? digits : "";
 }
 
 }  // namespace
 
 std::vector<std::string> SpellingsOf(std::string_view value) {
-  TTexts texts = {std::string(value)};
-  AddEncodings(texts, value);
-  std::string const digits = Lower(Compact(value));
-  if (digits != value) texts.push_back(digits);
-  if (IsHex(digits) && digits.size() >= kShortestHex && digits.size() % 2 == 0 && !IsIPv4(value)) AddHex(texts, digits);
-  if (IsHex(digits) && digits.size() == kUuidDigits) AddUuid(texts, digits);
+  TTexts texts = {std::string(value), Lower(Compact(value)), PercentEncoded(value), Utf16(value), HexOf(Utf16(value))};
+  AddHex(texts, HexOf(value));
+  std::string const digits = DigitsOf(value);
+  if (!digits.empty()) AddHex(texts, digits);
+  if (digits.size() == kUuidDigits) AddUuid(texts, digits);
   AddAddress(texts, std::string(value));
-  for (std::string& text : texts) text = Lower(text);
-  TTexts different;
-  for (std::string& text : texts)
-    if (std::find(different.begin(), different.end(), text) == different.end()) different.push_back(std::move(text));
-  return different;
+  return texts;
+}
+
+std::vector<std::string> Base64Of(std::string_view value) {
+  TTexts texts;
+  if (value.size() >= kShortestBase64)
+    for (std::size_t skipped = 0; skipped < 3; ++skipped) texts.push_back(Base64(value, skipped));
+  return texts;
+}
+
+std::string CanonicalForm(std::string_view value) {
+  constexpr std::size_t macDigits = 12, wwnDigits = 16;
+  in6_addr bytes{};
+  if (::inet_pton(AF_INET6, std::string(value).c_str(), &bytes) == 1)
+    return HexOf({reinterpret_cast<char const*>(&bytes), sizeof bytes});
+  std::string digits = DigitsOf(value);
+  if (digits.size() == macDigits || digits.size() == wwnDigits || digits.size() == kUuidDigits) return digits;
+  std::string const words = NormalWords(value);
+  return words.empty() ? std::string(value) : words;
 }
 
 }  // namespace NQRVZEP20

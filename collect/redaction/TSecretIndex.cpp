@@ -2,12 +2,13 @@
 #include "collect/redaction/TSecretIndex.h"
 
 #include "collect/redaction/Spellings.h"
+#include "collect/redaction/TNormalText.h"
 #include "collect/redaction/TPseudonyms.h"
 #include "collect/redaction/Texts.h"
 
 #include <algorithm>
 #include <cstdint>
-#include <set>
+#include <functional>
 
 namespace NQRVZEP20 {
 
@@ -43,43 +44,76 @@ std::string Upper(std::string text) {
   return text;
 }
 
-bool IsSame(std::string_view text, std::string_view spelling, bool isExact) {
-  if (isExact) return text == spelling;
-  return text.size() == spelling.size() &&
-         std::equal(text.begin(), text.end(), spelling.begin(), [](char a, char b) { return Lower(a) == b; });
+// `lower` is in lower case.
+bool IsSame(std::string_view text, std::string_view lower) {
+  return text.size() == lower.size() &&
+         std::equal(text.begin(), text.end(), lower.begin(), [](char a, char b) { return Lower(a) == b; });
+}
+
+std::size_t FirstWord(std::string_view text) {
+  std::size_t at = 0;
+  while (at < text.size() && SizeOfWordCharacter(text, at) == 0) ++at;
+  return at;
+}
+
+std::size_t EndOfLastWord(std::string_view text) {
+  std::size_t last = 0;
+  for (std::size_t at = 0; at < text.size();) {
+    std::size_t const end = EndOfWord(text, at);
+    if (end > at) last = end;
+    at = std::max(end, at + 1);
+  }
+  return last;
 }
 
 }  // namespace
 
 void TSecretIndex::Add(ESecretKind kind, std::string const& value) {
   if (!fValues.insert(value).second) return;
-  std::size_t const secret = fSecrets.size();
-  fSecrets.push_back({kind, value});
-  bool const isExact = IsLetters(value);
-  if (isExact)
-    for (std::string const& text : std::set<std::string>{value, Upper(value), Lower(value)}) AddSpelling({text, 0, secret, true});
+  auto const [known, isNew] = fKnown.emplace(CanonicalForm(value), fSecrets.size());
+  std::size_t const secret = known->second;
+  if (isNew) fSecrets.push_back({kind, value});
+  if (isNew) AddSpelling(value, {secret, true, IsLetters(value)});
+  if (!isNew) AddCase(value);
   for (std::string const& text : SpellingsOf(value)) {
-    if (isExact && text == Lower(value)) continue;
-    AddSpelling({text, 0, secret, false});
-    AddPart(text, secret);
+    AddSpelling(text, {secret, false, false});
+    if (EndOfWord(text, 0) == text.size() && HasDigit(text)) AddPart({Lower(text), secret, false});
+  }
+  for (std::string const& text : Base64Of(value)) AddBase64(text, secret);
+}
+
+// A word of letters that is known in several cases is found in all.
+void TSecretIndex::AddCase(std::string const& value) {
+  auto const known = fSpellings.find(NormalWords(value));
+  if (known != fSpellings.end() && !IsAsWritten(known->second, value)) known->second.fIsExact = false;
+}
+
+// The value of a secret takes the place of another spelling.
+void TSecretIndex::AddSpelling(std::string const& text, TSpelling const& spelling) {
+  std::string const normal = NormalWords(text);
+  if (normal.empty() || (!spelling.fIsValue && fSpellings.count(normal) > 0)) return;
+  fSpellings[normal] = spelling;
+  std::string const word = normal.substr(0, EndOfWord(normal, 0));
+  fWords.set(HashOf(word) % kHashes);
+  auto& sizes = fSizes[word];
+  auto const place = std::lower_bound(sizes.begin(), sizes.end(), normal.size(), std::greater<>());
+  if (place == sizes.end() || *place != normal.size()) sizes.insert(place, normal.size());
+}
+
+// The marks '+' and '/' separate words of base64.
+void TSecretIndex::AddBase64(std::string const& text, std::size_t secret) {
+  for (std::size_t begin = 0; begin < text.size();) {
+    std::size_t const end = EndOfWord(text, begin);
+    AddPart({Lower(text.substr(begin, end - begin)), secret, true});
+    begin = end + 1;
   }
 }
 
-void TSecretIndex::AddSpelling(TSpelling spelling) {
-  std::string const& text = spelling.fText;
-  while (spelling.fPrefix < text.size() && SizeOfWordCharacter(text, spelling.fPrefix) == 0) ++spelling.fPrefix;
-  std::string const word = Lower(text.substr(spelling.fPrefix, EndOfWord(text, spelling.fPrefix) - spelling.fPrefix));
-  if (word.empty()) return;
-  fWords.set(HashOf(word) % kHashes);
-  auto& known = fSpellings[word];
-  auto const isShorter = [&](TSpelling const& other) { return other.fText.size() < text.size(); };
-  known.insert(std::find_if(known.begin(), known.end(), isShorter), std::move(spelling));
-}
-
-void TSecretIndex::AddPart(std::string const& text, std::size_t secret) {
-  if (text.size() < kPartSize || !HasDigit(text) || EndOfWord(text, 0) != text.size()) return;
-  fBegins.set(HashOf(text.substr(0, kPartSize)) % kHashes);
-  fParts[text.substr(0, kPartSize)].push_back({text, 0, secret, false});
+void TSecretIndex::AddPart(TPart part) {
+  if (part.fText.size() < kPartSize) return;
+  std::string const first = part.fText.substr(0, kPartSize);
+  fBegins.set(HashOf(first) % kHashes);
+  fParts[first].push_back(std::move(part));
 }
 
 TSecretCounts TSecretIndex::Counts() const {
@@ -93,7 +127,7 @@ std::optional<std::string> TSecretIndex::Rewritten(std::string_view text, TRepla
   std::size_t copied = 0;
   for (std::size_t at = 0; at < text.size();) {
     std::size_t const end = EndOfWord(text, at);
-    THit const hit = end > at ? HitAt(text, copied, at, end) : THit{};
+    THit const hit = end > at ? HitAtWord(text, copied, at, end) : THit{};
     at = std::max(end, at + 1);
     if (hit.fEnd == 0) continue;
     result += text.substr(copied, hit.fBegin - copied);
@@ -104,48 +138,85 @@ std::optional<std::string> TSecretIndex::Rewritten(std::string_view text, TRepla
   return result += text.substr(copied);
 }
 
+// The hit at the word, or behind the escape that is its begin: "zx81" in "%20zx81".
+TSecretIndex::THit TSecretIndex::HitAtWord(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const {
+  if (THit const hit = HitAt(text, from, begin, end); hit.fEnd > 0) return hit;
+  std::size_t const escape = SizeOfEscapeAt(text, begin);
+  return escape > 0 && begin + escape < end ? HitAt(text, begin + escape, begin + escape, end) : THit{};
+}
+
 // The secret at the word from `begin` to `end`; the text up to `from` is replaced already. Without one, the end of the hit is 0.
 TSecretIndex::THit TSecretIndex::HitAt(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const {
-  if (TSpelling const* const spelling = LongestAt(text, from, begin, end)) {
-    std::size_t const first = begin - spelling->fPrefix;
-    return {first, first + spelling->fText.size(), &fSecrets[spelling->fSecret]};
-  }
-  if (TSecret const* const secret = SecretIn(text.substr(begin, end - begin))) return {begin, end, secret};
+  if (THit const hit = LongestAt(text, from, begin, end); hit.fEnd > 0) return hit;
+  if (THit const hit = WordWith(text, from, begin, end); hit.fEnd > 0) return hit;
   std::size_t const size = SizeOfPseudonym(text.substr(begin));
   return {begin, size == 0 ? 0 : begin + size, nullptr};
 }
 
-TSecretIndex::TSpelling const* TSecretIndex::LongestAt(std::string_view text, std::size_t from, std::size_t begin,
-                                                       std::size_t end) const {
+TSecretIndex::THit TSecretIndex::LongestAt(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const {
   std::string_view const word = text.substr(begin, end - begin);
-  if (fSecrets.empty() || !fWords.test(HashOf(word) % kHashes)) return nullptr;
-  auto const found = fSpellings.find(Lower(word));
-  if (found == fSpellings.end()) return nullptr;
-  for (TSpelling const& spelling : found->second) {
-    std::size_t const first = begin - spelling.fPrefix, size = spelling.fText.size();
-    bool const isFree = begin - from >= spelling.fPrefix;
-    bool const touches = from > 0 && first == from;  // the pseudonyms would join to one word: "user-1user-2"
-    if (!isFree || touches || first + size > text.size() || !IsWordBound(text, first, first + size)) continue;
-    if (IsSame(text.substr(first, size), spelling.fText, spelling.fIsExact)) return &spelling;
+  if (fSecrets.empty() || !fWords.test(HashOf(word) % kHashes)) return {};
+  auto const sizes = fSizes.find(Lower(word));
+  if (sizes == fSizes.end()) return {};
+  TNormalText const normal(text.substr(begin), sizes->second.front());
+  for (std::size_t const size : sizes->second) {
+    if (!normal.HasWordEnd(size)) continue;
+    auto const found = fSpellings.find(std::string(normal.Text().substr(0, size)));
+    THit const hit{begin, begin + normal.EndOf(size), found == fSpellings.end() ? nullptr : &fSecrets[found->second.fSecret]};
+    if (hit.fSecret == nullptr || !IsAsWritten(found->second, text.substr(begin, hit.fEnd - begin))) continue;
+    return found->second.fIsValue ? WithSigns(hit, text, from) : hit;
   }
-  return nullptr;
+  return {};
 }
 
-TSecret const* TSecretIndex::SecretIn(std::string_view word) const {
-  if (fParts.empty() || word.size() < kPartSize || !HasDigit(word)) return nullptr;
+// Whether the text, which has the normal form of the spelling, is one: in the cases of a word of letters, and without a space
+// that may separate two words of a language.
+bool TSecretIndex::IsAsWritten(TSpelling const& spelling, std::string_view text) const {
+  std::string const& value = fSecrets[spelling.fSecret].fValue;
+  if (!spelling.fIsValue) return true;
+  if (spelling.fIsExact) return text == value || text == Upper(value) || text == Lower(value);
+  return text.find(' ') == text.npos || value.find(' ') != value.npos || HasDigit(value);
+}
+
+// With the marks before and after the value: "(bob)". Pseudonyms would otherwise join to one word: "user-1user-2".
+TSecretIndex::THit TSecretIndex::WithSigns(THit const& hit, std::string_view text, std::size_t from) const {
+  std::string_view const value = hit.fSecret->fValue;
+  std::size_t const before = FirstWord(value), after = value.size() - EndOfLastWord(value);
+  if (hit.fBegin - from < before || hit.fEnd + after > text.size()) return hit;
+  std::size_t const begin = hit.fBegin - before, end = hit.fEnd + after;
+  bool const touches = from > 0 && begin == from;
+  bool const isSame =
+      text.substr(begin, before) == value.substr(0, before) && text.substr(hit.fEnd, after) == value.substr(value.size() - after);
+  return isSame && !touches && IsWordBound(text, begin, end) ? THit{begin, end, hit.fSecret} : hit;
+}
+
+// The word, if it contains a secret. One in base64 is a spelling together with its other words.
+TSecretIndex::THit TSecretIndex::WordWith(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const {
+  TPart const* const part = PartIn(text.substr(begin, end - begin));
+  if (part == nullptr) return {};
+  if (part->fIsBase64) {
+    auto const isInner = [&](std::size_t at) { return at < text.size() && (text[at] == '+' || text[at] == '/'); };
+    while (begin > from + 1 && (IsLetterOrDigit(text[begin - 1]) || isInner(begin - 1))) --begin;
+    while (end < text.size() && (IsLetterOrDigit(text[end]) || isInner(end))) ++end;
+  }
+  return {begin, end, &fSecrets[part->fSecret]};
+}
+
+TSecretIndex::TPart const* TSecretIndex::PartIn(std::string_view word) const {
+  if (fParts.empty() || word.size() < kPartSize) return nullptr;
   std::uint32_t hash = HashOf(word.substr(0, kPartSize));
   for (std::size_t at = 0;; ++at) {
-    TSecret const* const secret = fBegins.test(hash % kHashes) ? PartAt(word, at) : nullptr;
-    if (secret != nullptr || at + kPartSize == word.size()) return secret;
+    TPart const* const part = fBegins.test(hash % kHashes) ? PartAt(word, at) : nullptr;
+    if (part != nullptr || at + kPartSize == word.size()) return part;
     hash = NextHash(hash, word[at], word[at + kPartSize]);
   }
 }
 
-TSecret const* TSecretIndex::PartAt(std::string_view word, std::size_t at) const {
+TSecretIndex::TPart const* TSecretIndex::PartAt(std::string_view word, std::size_t at) const {
   auto const found = fParts.find(Lower(word.substr(at, kPartSize)));
   if (found == fParts.end()) return nullptr;
-  for (TSpelling const& part : found->second)
-    if (IsSame(word.substr(at, part.fText.size()), part.fText, false)) return &fSecrets[part.fSecret];
+  for (TPart const& part : found->second)
+    if (IsSame(word.substr(at, part.fText.size()), part.fText)) return &part;
   return nullptr;
 }
 

@@ -20,14 +20,15 @@ struct TSecret {
   std::string fValue;
 };
 
-// Finds secrets in texts, in all their spellings (Spellings.h) and in upper and lower case. A secret of letters alone, which may
-// be a word of a language, is found in its own case and in upper case only.
+// Finds secrets in texts, in all their spellings (Spellings.h), with any marks (TNormalText.h) and in upper and lower case. A
+// secret of letters alone, which may be a word of a language, is found in its own case and in upper and lower case only; one
+// without digits with a space only where it has one itself.
 //
 // A secret is found where no word continues at its ends. A longer word that contains a secret of six characters or more, with a
-// digit among them, is a spelling of it: "enx525400112201".
+// digit among them, or one in base64, is a spelling of it: "enx525400112201".
 class TSecretIndex {
 public:
-  // A value that is known already is ignored.
+  // Another spelling of a value that is known already (CanonicalForm) belongs to that secret.
   void Add(ESecretKind kind, std::string const& value);
 
   std::vector<TSecret> const& Secrets() const { return fSecrets; }
@@ -43,28 +44,41 @@ private:
   static constexpr std::size_t kHashes = 1 << 16;
 
   struct TSpelling {
-    std::string fText;
-    std::size_t fPrefix;  // the number of bytes before its first word
     std::size_t fSecret;
+    bool fIsValue;  // of the secret itself
     bool fIsExact;  // whether case matters
   };
+  struct TPart {
+    std::string fText;
+    std::size_t fSecret;
+    bool fIsBase64;
+  };
   struct THit {
-    std::size_t fBegin, fEnd;
-    TSecret const* fSecret;
+    std::size_t fBegin = 0, fEnd = 0;
+    TSecret const* fSecret = nullptr;
   };
 
-  void AddSpelling(TSpelling spelling);
-  void AddPart(std::string const& text, std::size_t secret);
+  void AddCase(std::string const& value);
+  void AddSpelling(std::string const& text, TSpelling const& spelling);
+  void AddBase64(std::string const& text, std::size_t secret);
+  void AddPart(TPart part);
+  THit HitAtWord(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const;
   THit HitAt(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const;
-  TSpelling const* LongestAt(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const;
-  TSecret const* SecretIn(std::string_view word) const;
-  TSecret const* PartAt(std::string_view word, std::size_t at) const;
+  THit LongestAt(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const;
+  bool IsAsWritten(TSpelling const& spelling, std::string_view text) const;
+  THit WithSigns(THit const& hit, std::string_view text, std::size_t from) const;
+  THit WordWith(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const;
+  TPart const* PartIn(std::string_view word) const;
+  TPart const* PartAt(std::string_view word, std::size_t at) const;
 
   std::vector<TSecret> fSecrets;
-  std::unordered_set<std::string> fValues;                             // of the secrets
-  std::unordered_map<std::string, std::vector<TSpelling>> fSpellings;  // by the first word, in lower case; the longest first
-  std::unordered_map<std::string, std::vector<TSpelling>> fParts;      // of longer words, by their first bytes
-  std::bitset<kHashes> fWords, fBegins;                                // hashes of both keys
+  std::unordered_set<std::string> fValues;
+  std::unordered_map<std::string, std::size_t> fKnown;    // the secrets by their canonical forms
+  std::unordered_map<std::string, TSpelling> fSpellings;  // by their normal forms
+  std::unordered_map<std::string, std::vector<std::size_t>>
+      fSizes;                                                  // of the normal forms, by their first word; the longest first
+  std::unordered_map<std::string, std::vector<TPart>> fParts;  // of longer words, by their first bytes
+  std::bitset<kHashes> fWords, fBegins;                        // hashes of the first words, and of the first bytes of parts
 };
 
 }  // namespace NQRVZEP20

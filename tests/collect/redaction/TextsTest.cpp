@@ -61,15 +61,28 @@ TEST(TextsTest, LettersOfAnyLanguageContinueAWordAndOtherCharactersEndIt) {
   }
 }
 
+// The marks are those of the normal form.
 TEST(SpellingsTest, AValueHasASpellingInEachEncoding) {
-  EXPECT_THAT(SpellingsOf("KQ12345"), IsSupersetOf({"kq12345", "4b513132333435", "4b:51:31:32:33:34:35", "s1exmjm0n"}));
-  EXPECT_THAT(SpellingsOf("525400112202"), IsSupersetOf({"52:54:00:11:22:02", "52-54-00-11-22-02", "5254.0011.2202"}));
+  EXPECT_THAT(SpellingsOf("KQ12345"), IsSupersetOf({"KQ12345", "4b513132333435", "4b-51-31-32-33-34-35"}));
+  EXPECT_THAT(Base64Of("KQ12345"), ElementsAre("S1ExMjM0N", "tRMTIzND", "LUTEyMzQ1"));
+  EXPECT_THAT(Base64Of("KQ123"), IsEmpty());
+  EXPECT_THAT(SpellingsOf("525400112202"), IsSupersetOf({"52-54-00-11-22-02", "5254-0011-2202"}));
   EXPECT_THAT(SpellingsOf("192.0.2.1"), IsSupersetOf({"c0000201", "010200c0"}));
   EXPECT_THAT(SpellingsOf("2001:db8::1"),
-              IsSupersetOf({"20010db8000000000000000000000001", "2001:0db8:0000:0000:0000:0000:0000:0001"}));
+              IsSupersetOf({"20010db8000000000000000000000001", "2001-0db8-0000-0000-0000-0000-0000-0001"}));
   EXPECT_THAT(SpellingsOf("3F2A9C54-11D0-4B8E-9A7E-52540011AA01"),
               IsSupersetOf({"3f2a9c5411d04b8e9a7e52540011aa01", "549c2a3f-d011-8e4b-9a7e-52540011aa01"}));
-  EXPECT_THAT(SpellingsOf("a b\"c"), IsSupersetOf({"a%20b%22c", "a b\\\"c"}));
+}
+
+TEST(SpellingsTest, TheCanonicalFormIsThatOfAllSpellings) {
+  for (char const* mac : {"525400112202", "52:54:00:11:22:02", "52-54-00-11-22-02", "5254.0011.2202"})
+    EXPECT_EQ(CanonicalForm(mac), "525400112202");
+  EXPECT_EQ(CanonicalForm("2001:DB8:0::1"), CanonicalForm("2001:db8::1"));
+  EXPECT_EQ(CanonicalForm("naa.5000C500A1B2C3D4"), CanonicalForm("0x5000c500a1b2c3d4"));
+  EXPECT_EQ(CanonicalForm("3F2A9C54-11D0-4B8E-9A7E-52540011AA01"), "3f2a9c5411d04b8e9a7e52540011aa01");
+  EXPECT_EQ(CanonicalForm("ZX81 77"), CanonicalForm("zx81_77"));
+  EXPECT_NE(CanonicalForm("1.11.1.1"), CanonicalForm("11.1.1.1"));
+  EXPECT_EQ(CanonicalForm("()"), "()");
 }
 
 }  // namespace

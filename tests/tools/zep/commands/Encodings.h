@@ -51,14 +51,33 @@ inline std::string Reversed(std::string const& digits) {
   return reversed;
 }
 
-// The value in every encoding, in lower case.
+// Percent-encoded as in a URL.
+inline std::string UrlOf(std::string const& value) {
+  std::string text;
+  for (unsigned char const byte : value) {
+    bool const isPlain = std::isalnum(byte) != 0 || std::string("-._~").find(static_cast<char>(byte)) != std::string::npos;
+    text += isPlain ? std::string(1, static_cast<char>(byte)) : "%" + HexOf({static_cast<char>(byte)}, "");
+  }
+  return text;
+}
+
+// With this mark in place of each of its own.
+inline std::string WithMark(std::string text, char mark) {
+  for (char& byte : text)
+    if (std::isalnum(static_cast<unsigned char>(byte)) == 0) byte = mark;
+  return text;
+}
+
+// The value in every encoding.
 inline std::set<std::string> EncodingsOf(std::string const& value) {
   std::string wide;
   for (char const byte : value) wide += std::string(1, byte) + '\0';
   std::string percent;
   for (unsigned char const byte : value)
     percent += std::isalnum(byte) != 0 ? std::string(1, static_cast<char>(byte)) : "%" + HexOf({static_cast<char>(byte)}, "");
-  std::set<std::string> encodings = {value, nlohmann::json(value).dump(), wide, HexOf(wide, ""), percent};
+  std::string const json = nlohmann::json(value).dump();
+  std::set<std::string> encodings = {value, json, nlohmann::json(json).dump(), wide, HexOf(wide, ""), percent, UrlOf(value)};
+  for (char const mark : {'_', ' ', '.', ':'}) encodings.insert(WithMark(value, mark));
   for (char const* separator : {"", ":", "-", " "}) encodings.insert(HexOf(value, separator));
   if (value.size() >= 6)  // shorter values have base64 forms that are common words
     for (std::size_t skipped : {0, 1, 2}) encodings.insert(Base64(value, skipped));
@@ -77,9 +96,7 @@ inline std::set<std::string> EncodingsOf(std::string const& value) {
       for (std::size_t at = 0; at < 12; at += 2) grouped += (at == 0 ? "" : separator) + digits.substr(at, 2);
       encodings.insert(grouped);
     }
-  std::set<std::string> lower;
-  for (std::string const& text : encodings) lower.insert(Lower(text));
-  return lower;
+  return encodings;
 }
 
 }  // namespace NQRVZEP20
