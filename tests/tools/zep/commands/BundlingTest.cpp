@@ -91,7 +91,8 @@ TEST_F(BundlingTest, ABundleIsVerifiedWithTheOrdinaryTools) {
   EXPECT_THAT(Shell("openssl cms -verify -binary -inform DER -in manifest.p7s -content manifest.json -out /dev/null -CAfile '" +
                     authority.fCertificateFile + "'"),
               HasSubstr("Verification successful"));
-  for (auto const& piece : Verified()["pieces"]) {
+  auto const verified = Verified();
+  for (auto const& piece : verified["pieces"]) {
     std::string const name = piece["name"];
     EXPECT_EQ(Shell("sha256sum < " + name).substr(0, 64), piece["sha256"]);
     EXPECT_EQ(fs::file_size(Work(name)), piece["bytes"]);
