@@ -94,8 +94,9 @@ std::optional<TMember> TArchiveReader::Next() {
   if (status == ARCHIVE_EOF) return std::nullopt;
   if (status != ARCHIVE_OK) Throw(fName.empty() ? "" : " after its member " + Printable(fName));
   fName = WithoutEndSlash(TextOf(archive_entry_pathname(entry)));
+  fSize = static_cast<std::uint64_t>(archive_entry_size(entry));
   EMemberKind const kind = KindOf(entry);
-  if (kind != EMemberKind::kFile && archive_entry_size(entry) != 0)
+  if (kind != EMemberKind::kFile && fSize != 0)
     throw TArchiveError("its member " + Printable(fName) + " has a content, but is not a file");
   return TMember{kind, fName, TextOf(archive_entry_symlink(entry)), archive_entry_perm(entry), {}};
 }
@@ -111,13 +112,14 @@ void TArchiveReader::Read(std::uint64_t limit, std::function<void(std::string_vi
   char buffer[kBlock];
   for (;;) {
     la_ssize_t const count = archive_read_data(fArchive.get(), buffer, sizeof buffer);
-    if (count == 0) return;
+    if (count == 0) break;
     if (count < 0) Throw(" in its member " + Printable(fName));
     bytes += static_cast<std::uint64_t>(count);
     if (bytes > limit)
       throw TArchiveError("its member " + Printable(fName) + " is longer than " + std::to_string(limit) + " bytes");
     use({buffer, static_cast<std::size_t>(count)});
   }
+  if (bytes != fSize) throw TArchiveError("its member " + Printable(fName) + " has a hole at its end");
 }
 
 void TArchiveReader::Throw(std::string const& where) const {

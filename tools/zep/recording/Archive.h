@@ -58,7 +58,8 @@ public:
   // The next member; none at the end. A member of another kind, such as a device or a hard link, is an error.
   std::optional<TMember> Next();
 
-  // The content of the current member, which is an error if it is longer than `limit` bytes.
+  // The content of the current member, which is an error if it is longer than `limit` bytes, or has a hole at its end, which
+  // programs that unpack the archive would fill.
   std::string Content(std::uint64_t limit);
 
   // The same, passed to `use` piece by piece.
@@ -68,7 +69,8 @@ private:
   [[noreturn]] void Throw(std::string const& where) const;
 
   std::unique_ptr<archive, int (*)(archive*)> fArchive;
-  std::string fName;  // of the current member
+  std::string fName;        // of the current member
+  std::uint64_t fSize = 0;  // of its content, as its header says
 };
 
 }  // namespace NQRVZEP20::zep

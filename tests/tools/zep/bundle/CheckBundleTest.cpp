@@ -7,6 +7,7 @@
 
 #include <gmock/gmock.h>
 
+#include <cstdlib>
 #include <functional>
 #include <optional>
 
@@ -180,6 +181,16 @@ TEST_F(CheckBundleTest, AForeignOrCutFileIsRefused) {
     EXPECT_THAT(WhyRefused(bytes), testing::AnyOf(StartsWith("it is cut, damaged or not a zstd-compressed tar archive"),
                                                   StartsWith("it is not a bundle: its first member is not manifest.json")));
   EXPECT_THAT(WhyRefused(Packed({File("recording.json", "{}")})), StartsWith("it is not a bundle"));
+}
+
+// The checksum would be that of an empty file; tar would unpack zeros.
+TEST_F(CheckBundleTest, AMemberWithAHoleIsRefused) {
+  std::string const repack = "cd '" + fDir.Path() +
+                             "' && tar --zstd -xf bundle && truncate -s 0 report.json && truncate -s 1M report.json && " +
+                             "tar --sparse --zstd -cf bundle manifest.json report.json log/zep.log";
+  Write(Good());
+  ASSERT_EQ(std::system(repack.c_str()), 0);
+  EXPECT_EQ(WhyRefused(ReadFile(fDir.Path("bundle"))), "its member report.json has a hole at its end");
 }
 
 TEST_F(CheckBundleTest, NoMoreThanTheLimitsIsUnpacked) {
