@@ -5,7 +5,6 @@
 #include "collect/stored/StoredReport.h"
 #include "tools/zep/bundle/CollectorLog.h"
 #include "tools/zep/html/ReportHtml.h"
-#include "tools/zep/output/Json.h"
 #include "tools/zep/output/OutputFile.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/processes/Interrupts.h"
@@ -38,9 +37,12 @@ std::string ReadRecording(std::string const& file) {
   return content;
 }
 
-std::vector<std::string> RedactedKinds(TStoredReport const& report) {
-  if (report.fRedaction.empty()) return {};
-  return TJson::parse(report.fRedaction).at("kinds").get<std::vector<std::string>>();
+void AddPage(TBundle& bundle, std::string const& document) {
+  try {
+    bundle.Add(kPagePiece, ReportAsHtml(StoredReportFrom(document, kReportPiece)), "made from " + std::string(kReportPiece));
+  } catch (TStoredReportError const& failure) {
+    bundle.AddMissing(kPagePiece, failure.what());
+  }
 }
 
 }  // namespace
@@ -116,11 +118,16 @@ TEvidence EvidenceOfStored() {
 
 // ---- The bundle ----
 
-TBundleManifest WriteBundle(TBundleArguments const& arguments, std::string const& document, TEvidence const& evidence) {
-  TStoredReport const report = StoredReportFrom(document, kReportPiece);
-  TBundle bundle(RedactedKinds(report));
-  bundle.Add(kReportPiece, document, evidence.fMaking);
-  bundle.Add(kPagePiece, ReportAsHtml(report), "made from " + std::string(kReportPiece));
+std::vector<std::string> RedactedKinds(TJson const& document) {
+  auto const redaction = document.find("redaction");
+  return redaction == document.end() ? std::vector<std::string>() : redaction->at("kinds").get<std::vector<std::string>>();
+}
+
+TBundleManifest WriteBundle(TBundleArguments const& arguments, std::string const& text, std::vector<std::string> const& redacted,
+                            TEvidence const& evidence) {
+  TBundle bundle(redacted);
+  bundle.Add(kReportPiece, text, evidence.fMaking);
+  AddPage(bundle, text);
   if (evidence.fRecording) bundle.Add(kRecordingPiece, *evidence.fRecording, evidence.fRecordingMaking);
   if (evidence.fLog) bundle.Add(kLogPiece, *evidence.fLog, "the log of zep and its plug-ins, without passwords");
   for (TMissingPiece const& row : evidence.fMissing) bundle.AddMissing(row.fPiece, row.fReason);

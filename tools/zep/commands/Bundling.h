@@ -2,6 +2,7 @@
 #pragma once
 
 #include "tools/zep/bundle/TBundle.h"
+#include "tools/zep/output/Json.h"
 #include "tools/zep/recording/TRecorder.h"
 
 #include <optional>
@@ -59,9 +60,13 @@ private:
 // The evidence of a stored report.
 TEvidence EvidenceOfStored();
 
-// Packs, signs and writes the bundle of the report with this document, and returns its manifest. Throws like WritePrivateFile,
-// and TFailure after an interrupt.
-TBundleManifest WriteBundle(TBundleArguments const& arguments, std::string const& document, TEvidence const& evidence);
+// The kinds of secrets that are redacted in the document of a report.
+std::vector<std::string> RedactedKinds(TJson const& document);
+
+// Packs, signs and writes the bundle of the report whose document has this text, and returns its manifest. Throws like
+// WritePrivateFile, and TFailure after an interrupt. A page that cannot be made is missing.
+TBundleManifest WriteBundle(TBundleArguments const& arguments, std::string const& text, std::vector<std::string> const& redacted,
+                            TEvidence const& evidence);
 
 // For people: "The bundle db1.tar.zst has 4 pieces, and is not signed.", and what is missing.
 std::string TextAbout(TBundleManifest const& manifest, TBundleArguments const& arguments);

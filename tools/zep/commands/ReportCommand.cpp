@@ -30,7 +30,8 @@ namespace {
 
 // Writes the bundle of a stored report, and prints what it has unless the document is printed.
 void BundleFrom(TJson const& document, TReportArguments const& arguments) {
-  TBundleManifest const manifest = WriteBundle(arguments.fBundle, AsVerbatimText(document), EvidenceOfStored());
+  TBundleManifest const manifest =
+      WriteBundle(arguments.fBundle, AsVerbatimText(document), RedactedKinds(document), EvidenceOfStored());
   if (!arguments.fAsJson) WriteMessage(TextAbout(manifest, arguments.fBundle));
 }
 

@@ -90,8 +90,8 @@ std::optional<TFailure> WritePage(TMadeReport const& made, TReportArguments cons
 }
 
 void WriteBundleOf(TMadeReport const& made, TEvidence const& evidence, TReportArguments const& arguments) {
-  std::string const document = made.Document(EMessages::kWithoutSecrets).Text();
-  TBundleManifest const manifest = WriteBundle(arguments.fBundle, document, evidence);
+  TReportDocument const document = made.Document(EMessages::kWithoutSecrets);
+  TBundleManifest const manifest = WriteBundle(arguments.fBundle, document.Text(), RedactedKinds(document.Members()), evidence);
   if (!arguments.fAsJson) WriteMessage(TextAbout(manifest, arguments.fBundle));
 }
 

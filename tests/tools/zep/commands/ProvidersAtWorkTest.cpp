@@ -166,20 +166,23 @@ TEST_F(ProvidersAtWorkTest, AnInterruptLeavesNoProcess) {
   InterruptWhileItHangs(zep);
 }
 
-TEST_F(ProvidersAtWorkTest, AnInterruptedRecordingLeavesNoFiles) {
+TEST_F(ProvidersAtWorkTest, AnInterruptedRecordingOrBundleLeavesNoFiles) {
   Add({"Hangs"});
-  TTempDir const temporary;
-  std::string const file = fZep.Path("here.rec");
-  pid_t const zep = ::fork();
-  if (zep == 0) {
-    ::setenv("ZEP_MISDEEDS", fZep.Path("").c_str(), 1);
-    ::setenv("TMPDIR", temporary.Path().c_str(), 1);
-    ::execl(fZep.Path("bin/zep").c_str(), "zep", "record", file.c_str(), nullptr);
-    ::_exit(127);
+  TTempDir const temporary, work;
+  for (char const* command : {"record", "report --bundle"}) {
+    fs::remove(fZep.Path("Hangs"));
+    pid_t const zep = ::fork();
+    if (zep == 0) {
+      ::setenv("ZEP_MISDEEDS", fZep.Path("").c_str(), 1);
+      ::setenv("TMPDIR", temporary.Path().c_str(), 1);
+      std::string const line = "exec '" + fZep.Path("bin/zep") + "' " + command + " '" + work.Path("new") + "'";
+      ::execl("/bin/sh", "sh", "-c", line.c_str(), nullptr);
+      ::_exit(127);
+    }
+    InterruptWhileItHangs(zep);
+    EXPECT_TRUE(fs::is_empty(temporary.Path())) << command;
+    EXPECT_TRUE(fs::is_empty(work.Path())) << command;
   }
-  InterruptWhileItHangs(zep);
-  EXPECT_TRUE(fs::is_empty(temporary.Path()));
-  EXPECT_FALSE(fs::exists(file));
 }
 
 TEST_F(ProvidersAtWorkTest, APlugInThatKillsZepLeavesNoProcess) {
