@@ -75,7 +75,20 @@ private:
   std::set<std::string, std::less<>> fNamespaces, fClasses;
 };
 
+// "a~1b" for "a/b", as in a JSON pointer
+std::string Escaped(std::string_view name) {
+  std::string escaped;
+  for (char const byte : name) escaped += byte == '/' ? "~1" : byte == '~' ? "~0" : std::string(1, byte);
+  return escaped;
+}
+
 }  // namespace
+
+std::string TPlace::AsText() const { return fParent == nullptr ? "" : fParent->AsText() + "/" + Escaped(fName); }
+
+std::string PlaceOfProperty(std::size_t instance, std::string_view name) {
+  return "/instances/" + std::to_string(instance) + "/properties/" + Escaped(name);
+}
 
 bool IsNumber(nlohmann::ordered_json const& object) {
   constexpr std::string_view numbers[] = {"uint", "sint", "real", "boolean", "datetime"};

@@ -10,18 +10,21 @@
 
 namespace NQRVZEP20 {
 
-// The place of a text in a document: "/instances/4/path".
+// The place of a text in a document, as a JSON pointer: "/instances/4/path".
 class TPlace {
 public:
   TPlace(TPlace const* parent, std::string_view name) : fParent(parent), fName(name) {}
 
   std::string_view Name() const { return fName; }
-  std::string AsText() const { return fParent == nullptr ? "" : fParent->AsText() + "/" + std::string(fName); }
+  std::string AsText() const;
 
 private:
   TPlace const* fParent;
   std::string_view fName;
 };
+
+// The place of a property of the instance with this index, as TPlace::AsText returns it.
+std::string PlaceOfProperty(std::size_t instance, std::string_view name);
 
 // Whether the object is a property whose value is a number or a time, perhaps as a text.
 bool IsNumber(nlohmann::ordered_json const& object);

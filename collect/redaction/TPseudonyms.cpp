@@ -65,6 +65,16 @@ void CheckMap(TJson const& document) {
 
 std::size_t SizeOfPseudonym(std::string_view text) { return PartsOf(text).fSize; }
 
+std::size_t SizeWithoutLetters(std::string_view pseudonym) {
+  TParts const parts = PartsOf(pseudonym);
+  return parts.fHasLetter ? pseudonym.find_last_of("0123456789") + 1 : parts.fSize;
+}
+
+bool IsPseudonymOfSecret(std::string_view text) {
+  TParts const parts = PartsOf(text);
+  return parts.fSize > 0 && parts.fSize == text.size() && parts.fPrefix != kPrefixes[kSecretKinds.size()];
+}
+
 TPseudonyms TPseudonyms::From(TJson const& document) {
   CheckMap(document);
   TPseudonyms pseudonyms(TextAt(document, "map", ""));

@@ -22,6 +22,12 @@ struct TRedactionError : std::runtime_error {
 // The length of the pseudonym with which the text begins, such as "serial-12b"; 0 if it begins with none.
 std::size_t SizeOfPseudonym(std::string_view text);
 
+// The size of a pseudonym without the letters that name a spelling: 8 of "serial-12b".
+std::size_t SizeWithoutLetters(std::string_view pseudonym);
+
+// Whether all of the text is the pseudonym of a secret, not of a text that looks like one.
+bool IsPseudonymOfSecret(std::string_view text);
+
 // The map between secrets and their pseudonyms: "serial-1", "host-2", "address-3", "user-4". Another spelling of the same value
 // has the same pseudonym with a letter: "address-3b". A text that looks like a pseudonym has one, too: "text-5".
 //

@@ -45,7 +45,7 @@ void TSecretCollector::Collect(TJson& document) {
   if (auto const classes = document.find("classes"); classes != document.end()) ReadClasses(*classes);
   for (char const* rows : {"identity", "details"}) CollectRows(document[rows]);
   std::size_t at = 0;
-  for (TJson& instance : document["instances"]) CollectInstance(instance, "/instances/" + std::to_string(at++));
+  for (TJson& instance : document["instances"]) CollectInstance(instance, at++);
   RewriteTexts(document, [&](std::string_view text, TPlace const& place) {
     CollectShapes(text, IsMessage(place.Name()));
     return std::nullopt;
@@ -72,12 +72,12 @@ void TSecretCollector::CollectRows(TJson const& rows) {
     if (auto const meaning = MeaningOfRow(key)) AddAll(*meaning, row["value"]);
 }
 
-void TSecretCollector::CollectInstance(TJson& instance, std::string const& place) {
+void TSecretCollector::CollectInstance(TJson& instance, std::size_t at) {
   auto const& classes = LineOf(instance["class"].get_ref<std::string const&>());
   TJson& properties = instance["properties"];
   for (auto& [name, property] : properties.get_ref<TJson::object_t&>()) {
     TJson const& value = property["value"];
-    if (auto const meaning = MeaningOfProperty(classes, name)) AddProperty(*meaning, property, place + "/properties/" + name);
+    if (auto const meaning = MeaningOfProperty(classes, name)) AddProperty(*meaning, property, PlaceOfProperty(at, name));
     if (name == "InstanceID") ForEachString(value, [&](std::string const& text) { AddIdOfPool(text); });
     if (name == "Links") ForEachString(value, [&](std::string const& text) { AddAddressesIn(text, true); });
     if (name == "OtherIdentifyingInfo") CollectDescribed(properties, value);
@@ -119,7 +119,7 @@ void TSecretCollector::AddNumber(ESecretKind kind, TJson& property, std::string 
   std::string const text = TextOf(property);
   if (property["value"].is_null() || IsPlaceholder(kind, text) || !IsWanted(kind)) return;
   fIndex.Add(kind, text);
-  fNumbers.push_back({&property, place, {kind, text}});
+  fNumbers.push_back({&property, place, text});
 }
 
 void TSecretCollector::AddAll(EMeaning meaning, TJson const& value) {

@@ -6,6 +6,7 @@
 
 #include <nlohmann/json.hpp>
 
+#include <cstddef>
 #include <string>
 #include <string_view>
 #include <unordered_map>
@@ -17,7 +18,7 @@ namespace NQRVZEP20 {
 struct TSecretNumber {
   nlohmann::ordered_json* fProperty;
   std::string fPlace;  // "/instances/4/properties/SerialNumber"
-  TSecret fSecret;
+  std::string fValue;  // as it is in the index
 };
 
 // Collects the secrets of these kinds in the document of a report.
@@ -38,7 +39,7 @@ private:
   void ReadClasses(TJson const& classes);
   std::vector<std::string> const& LineOf(std::string const& name);
   void CollectRows(TJson const& rows);
-  void CollectInstance(TJson& instance, std::string const& place);
+  void CollectInstance(TJson& instance, std::size_t at);
   void CollectDescribed(TJson const& properties, TJson const& values);
   void CollectShapes(std::string_view text, bool isMessage);
   void AddAddressesIn(std::string_view text, bool withIPv4);

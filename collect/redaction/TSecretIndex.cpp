@@ -116,6 +116,8 @@ void TSecretIndex::AddPart(TPart part) {
   fParts[first].push_back(std::move(part));
 }
 
+TSecret const& TSecretIndex::SecretOf(std::string const& value) const { return fSecrets[fKnown.at(CanonicalForm(value))]; }
+
 TSecretCounts TSecretIndex::Counts() const {
   TSecretCounts counts{};
   for (TSecret const& secret : fSecrets) ++counts[static_cast<std::size_t>(secret.fKind)];

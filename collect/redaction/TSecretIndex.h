@@ -32,6 +32,9 @@ public:
   void Add(ESecretKind kind, std::string const& value);
 
   std::vector<TSecret> const& Secrets() const { return fSecrets; }
+  // The secret to which a value belongs that was added.
+  TSecret const& SecretOf(std::string const& value) const;
+
   TSecretCounts Counts() const;
 
   // Returns the replacement of a spelling. `secret` is null for a text that only looks like a pseudonym (TPseudonyms.h).
