@@ -14,7 +14,8 @@ std::vector<TRule> NetworkRules();
 std::vector<TRule> DeviceRules();
 std::vector<TRule> SensorRules();
 std::vector<TRule> LogRules();
-std::vector<TRule> ManagementControllerRules();
+std::vector<TRule> ManagementControllerRules();  // with EventLogRules
+std::vector<TRule> EventLogRules();              // of the controller's event log
 std::vector<TRule> HostRules();
 std::vector<TRule> SystemRules();
 
