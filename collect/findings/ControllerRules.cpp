@@ -44,18 +44,39 @@ bool IsJudged(std::string const& sensorType) {
   return std::any_of(std::begin(types), std::end(types), [&](char const* type) { return sensorType.rfind(type, 0) == 0; });
 }
 
+bool Contains(std::string const& text, char const* part) { return text.find(part) != std::string::npos; }
+
+constexpr char const *kPresent = "Presence detected", *kInserted = "Device Inserted/Device Present";
+constexpr char const* kAbsent = "Device Removed/Device Absent";
+
+// Whether the bay of the sensor's part is empty. A power supply may also report this by the lack of a state.
+bool IsAbsent(std::string const& type, std::string const& state, bool isError) {
+  bool const isSupply = type == "Power Supply" && !isError;
+  return state == kAbsent || (isSupply && !Contains(state, kPresent) && !Contains(state, kInserted));
+}
+
 // Whether the event log records that the part was removed. A bay that was never used has no such entry.
 bool WasRemoved(TRuleRun const& run, std::string const& part) {
-  std::string const removal = part + ": Presence detected, deasserted";
+  std::string const removals[] = {part + ": " + kPresent + ", deasserted", part + ": " + kInserted + ", deasserted",
+                                  part + ": " + kAbsent + ", asserted"};
   auto const entries = run.TryElements("ZEP_EventLogEntry");
   return std::any_of(entries.begin(), entries.end(), [&](TElement const& entry) {
     auto const text = entry.Text("RecordData");
-    return text.IsKnown() && text.fValue->rfind(removal, 0) == 0;
+    return text.IsKnown() && std::any_of(std::begin(removals), std::end(removals),
+                                         [&](std::string const& removal) { return text.fValue->rfind(removal, 0) == 0; });
   });
 }
 
-bool IsMissingSupply(TRuleRun const& run, TElement const& sensor, std::string const& type, std::string const& state) {
-  return type == "Power Supply" && state.find("Presence detected") == std::string::npos && WasRemoved(run, sensor.Label());
+void JudgeState(TRuleRun& run, TElement const& sensor, std::string const& type, TAnswer<std::string> const& state, bool isError) {
+  std::string const part = sensor.Label() + " (" + type + ")";
+  if (IsAbsent(type, *state.fValue, isError)) {
+    if (WasRemoved(run, sensor.Label()))
+      run.Add(sensor, state.fSource, ESeverity::kError, part + " is missing: the controller's event log records its removal",
+              "Insert it again. If it was removed on purpose, clear the event log (ipmitool sel clear).");
+  } else if (isError) {
+    run.Add(sensor, state.fSource, ESeverity::kError, "the controller reports a failure of " + part + ": " + *state.fValue,
+            "Check the part and its connections, and replace it.");
+  }
 }
 
 void AskStates(TRuleRun& run) {
@@ -66,14 +87,7 @@ void AskStates(TRuleRun& run) {
     bool const hasNumber = sensor.Value("UnitModifier").IsKnown();  // judged by its thresholds
     if (hasNumber || !type.IsKnown() || !IsJudged(*type.fValue) || !run.Know(sensor, status) || !run.Know(sensor, state))
       continue;
-    if (!status.fValue->empty() && status.fValue->front() == error)
-      run.Add(sensor, state.fSource, ESeverity::kError,
-              "the controller reports a failure of " + sensor.Label() + " (" + *type.fValue + "): " + *state.fValue,
-              "Check the part and its connections, and replace it.");
-    else if (IsMissingSupply(run, sensor, *type.fValue, *state.fValue))
-      run.Add(sensor, state.fSource, ESeverity::kError,
-              "the power supply " + sensor.Label() + " is missing: the controller's event log records its removal",
-              "Insert it again. If it was removed on purpose, clear the event log (ipmitool sel clear).");
+    JudgeState(run, sensor, *type.fValue, state, !status.fValue->empty() && status.fValue->front() == error);
   }
 }
 

@@ -117,21 +117,41 @@ TEST(ControllerRulesTest, AFailedPartIsNamed) {
   EXPECT_THAT(Problems(rule, Sensor("System ACPI Power State", error)), IsEmpty());
 }
 
+std::string PartIn(std::string const& type, std::string const& state, int status = 0) {
+  return OnController("instance of CIM_Sensor { DeviceID = \"s\"; ElementName = \"PSU 1\"; CurrentState = \"" + state +
+                      "\"; OtherSensorTypeDescription = \"" + type + "\"; OperationalStatus = {" + std::to_string(status) +
+                      "}; };");
+}
+
+std::string Logged(std::string const& text) {
+  return "instance of ZEP_EventLogEntry { RecordID = \"1\"; RecordData = \"" + text + "\"; };";
+}
+
 TEST(ControllerRulesTest, APowerSupplyThatWasRemovedIsMissing) {
-  auto const supply = [](char const* type, char const* state) {
-    return OnController(std::string("instance of CIM_Sensor { DeviceID = \"s\"; ElementName = \"PSU 1\"; CurrentState = \"") +
-                        state + "\"; OtherSensorTypeDescription = \"" + type + "\"; OperationalStatus = {0}; };");
-  };
-  auto const logged = [](char const* text) {
-    return std::string("instance of ZEP_EventLogEntry { RecordID = \"1\"; RecordData = \"") + text + "\"; };";
-  };
-  std::string const rule = "controller-part-failed", removal = logged("PSU 1: Presence detected, deasserted");
-  EXPECT_THAT(Problems(rule, supply("Power Supply", "none") + removal),
-              ElementsAre("error: the power supply PSU 1 is missing: the controller's event log records its removal"));
-  EXPECT_THAT(Problems(rule, supply("Power Supply", "Presence detected") + removal), IsEmpty()) << "inserted again";
-  EXPECT_THAT(Problems(rule, supply("Power Supply", "none")), IsEmpty()) << "the bay was never used";
-  EXPECT_THAT(Problems(rule, supply("Power Supply", "none") + logged("PSU 12: Presence detected, deasserted")), IsEmpty());
-  EXPECT_THAT(Problems(rule, supply("Drive Slot", "none") + removal), IsEmpty());
+  std::string const rule = "controller-part-failed", removal = Logged("PSU 1: Presence detected, deasserted");
+  EXPECT_THAT(Problems(rule, PartIn("Power Supply", "none") + removal),
+              ElementsAre("error: PSU 1 (Power Supply) is missing: the controller's event log records its removal"));
+  EXPECT_THAT(Problems(rule, PartIn("Power Supply", "Presence detected") + removal), IsEmpty()) << "inserted again";
+  EXPECT_THAT(Problems(rule, PartIn("Power Supply", "none")), IsEmpty()) << "the bay was never used";
+  EXPECT_THAT(Problems(rule, PartIn("Power Supply", "none") + Logged("PSU 12: Presence detected, deasserted")), IsEmpty());
+  EXPECT_THAT(Problems(rule, PartIn("Drive Slot", "none") + removal), IsEmpty());
+}
+
+TEST(ControllerRulesTest, AnEmptyBayIsNotAFailure) {
+  constexpr int error = 6;
+  std::string const rule = "controller-part-failed", absent = "Device Removed/Device Absent";
+  for (char const* const type : {"Fan", "Memory", "Drive Slot", "Battery", "Power Supply"}) {
+    std::string const bay = PartIn(type, absent, error);
+    EXPECT_THAT(Problems(rule, bay), IsEmpty()) << type;
+    for (char const* const removal : {"Device Removed/Device Absent, asserted", "Device Inserted/Device Present, deasserted"})
+      EXPECT_THAT(
+          Problems(rule, bay + Logged(std::string("PSU 1: ") + removal)),
+          ElementsAre(std::string("error: PSU 1 (") + type + ") is missing: the controller's event log records its removal"))
+          << removal;
+    EXPECT_THAT(Problems(rule, PartIn(type, "Device Inserted/Device Present", 2) + Logged("PSU 1: " + absent + ", asserted")),
+                IsEmpty())
+        << type << " was inserted again";
+  }
 }
 
 TEST(ControllerRulesTest, AMachineWithoutAControllerIsFine) {
