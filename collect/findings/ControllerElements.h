@@ -9,4 +9,8 @@ namespace NQRVZEP20 {
 // in the same words for every class.
 std::vector<TElement> OfController(TRuleRun& run, char const* className);
 
+// Notes that the list of the controller ("sensors", "event log") was not read to its end, if it was not. Without a controller,
+// notes nothing.
+void NoteUnread(TRuleRun& run, std::string const& list);
+
 }  // namespace NQRVZEP20

@@ -81,6 +81,7 @@ void JudgeState(TRuleRun& run, TElement const& sensor, std::string const& type, 
 
 void AskStates(TRuleRun& run) {
   constexpr char const* error = "6";
+  for (char const* const list : {"sensors", "event log"}) NoteUnread(run, list);
   for (TElement const& sensor : OfController(run, "CIM_Sensor")) {
     auto const type = sensor.Text("OtherSensorTypeDescription"), state = sensor.Text("CurrentState");
     auto const status = sensor.Texts("OperationalStatus");

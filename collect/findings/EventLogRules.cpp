@@ -23,6 +23,7 @@ std::string EventOf(std::string const& text) { return text.substr(0, text.find('
 void AskEvents(TRuleRun& run) {
   constexpr std::uint64_t critical = 6;
   std::map<std::string, TEvents> byText;
+  NoteUnread(run, "event log");
   for (TElement const& log : run.TryElements("ZEP_EventLog")) run.Know(log, log.Number("CurrentNumberOfRecords"));
   for (TElement const& entry : OfController(run, "ZEP_EventLogEntry")) {
     auto const severity = entry.Number("PerceivedSeverity"), age = entry.Number("Age");

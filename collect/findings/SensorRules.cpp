@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "collect/findings/ControllerElements.h"
 #include "collect/findings/Rules.h"
 
 #include <algorithm>
@@ -18,6 +19,7 @@ bool Contains(std::string const& text, char const* part) { return text.find(part
 
 // Boards often have wrong thresholds for voltages and currents below the critical ones, so only temperatures are judged by them.
 void AskSensors(TRuleRun& run) {
+  NoteUnread(run, "sensors");
   for (TElement const& sensor : run.Elements("CIM_NumericSensor")) {
     auto const state = sensor.Text("CurrentState");
     if (Is(sensor, kTachometer) || !run.Know(sensor, state)) continue;
@@ -32,9 +34,10 @@ void AskSensors(TRuleRun& run) {
 }
 
 void AskFans(TRuleRun& run) {
+  NoteUnread(run, "sensors");
   auto const sensors = run.Elements("CIM_NumericSensor");
   bool const hasFan = std::any_of(sensors.begin(), sensors.end(), [](TElement const& each) { return Is(each, kTachometer); });
-  if (!sensors.empty() && !hasFan) run.NoteNotAsked({"no sensor measures the speed of a fan", ""});
+  if (!sensors.empty() && !hasFan && run.GetNotAsked().empty()) run.NoteNotAsked({"no sensor measures the speed of a fan", ""});
   for (TElement const& sensor : sensors) {
     if (!Is(sensor, kTachometer)) continue;
     auto const state = sensor.Text("CurrentState"), reading = sensor.Text("CurrentReading");

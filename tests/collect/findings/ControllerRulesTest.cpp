@@ -154,6 +154,23 @@ TEST(ControllerRulesTest, AnEmptyBayIsNotAFailure) {
   }
 }
 
+TEST(ControllerRulesTest, AListThatWasCutShortIsNoted) {
+  auto const reasonsOf = [](std::string const& rule, std::string const& parts) {
+    std::string const controller = "instance of ZEP_ManagementController { DeviceID = \"c\"; UnreadParts = {" + parts + "}; };";
+    std::vector<std::string> reasons;
+    for (TNotAsked const& notAsked : ResultOf(rule, FindingsOf(controller)).fNotAsked) reasons.push_back(notAsked.fReason);
+    return reasons;
+  };
+  std::string const sensors = "not read to the end: sensors: time", log = "not read to the end: event log: time";
+  std::string const all = "\"sensors: time\", \"event log: time\", \"FRU data: time\"";
+  EXPECT_THAT(reasonsOf("sensor-threshold", all), ElementsAre(sensors));
+  EXPECT_THAT(reasonsOf("fan-stopped", all), ElementsAre(sensors));
+  EXPECT_THAT(reasonsOf("controller-part-failed", all), ElementsAre(sensors, log));
+  EXPECT_THAT(reasonsOf("event-log-critical", all), ElementsAre(log));
+  for (char const* const rule : {"sensor-threshold", "controller-part-failed", "event-log-critical"})
+    EXPECT_THAT(reasonsOf(rule, "\"FRU data: time\""), IsEmpty()) << rule;
+}
+
 TEST(ControllerRulesTest, AMachineWithoutAControllerIsFine) {
   for (TRule const& rule : ControllerRules()) {
     EXPECT_THAT(Problems(rule.fId, ""), IsEmpty()) << rule.fId;

@@ -48,7 +48,7 @@ inline constexpr char const* kRuleClasses = R"(
   class CIM_Sensor { [key] string DeviceID; string ElementName; uint16 SensorType; string OtherSensorTypeDescription;
     string CurrentState; uint16 OperationalStatus[]; };
   class CIM_NumericSensor : CIM_Sensor { sint32 CurrentReading; sint32 UnitModifier; };
-  class ZEP_ManagementController { [key] string DeviceID; };
+  class ZEP_ManagementController { [key] string DeviceID; string UnreadParts[]; };
   class ZEP_ControllerAccount { [key] string Name; string UserID; uint16 EnabledState; string Privilege; boolean HasLANAccess; };
   class ZEP_EventLog { [key] string InstanceID; uint64 CurrentNumberOfRecords; [ValueSource("free")] uint64 FreeRecords;
     [ValueSource("lost")] boolean HasLostRecords; datetime ClockTime; };
