@@ -38,8 +38,8 @@ public:
 
   TThresholds const& Thresholds() const { return fThresholds; }
 
-  // The instances of the class and its subclasses, from all providers; with a sample, only those of the sample. If there are none
-  // because no provider has the class, or a provider could not read them, notes that the rule could not be asked.
+  // The instances of the class and its subclasses, from all providers; with a sample, only those of the sample. Notes
+  // why a provider could not read its own, also if another has some; and if there are none, why no provider looked for them.
   std::vector<TElement> Elements(std::string const& className);
 
   // The same, but notes nothing.

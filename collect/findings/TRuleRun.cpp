@@ -13,6 +13,9 @@ bool MeansNone(TMissing const& why) {
   return why.fCode == kMissingNotGiven || why.fCode == kMissingNotApplicable || why.fCode == kMissingNotDescribed;
 }
 
+// Whether there may be instances that the provider could not read. Without a source, most machines have none.
+bool MayHide(TMissing const& why) { return !MeansNone(why) && why.fCode != kMissingNoSource; }
+
 bool IsOfSample(std::vector<TNamespaceView> const& views) {
   return std::any_of(views.begin(), views.end(), [](TNamespaceView const& view) { return !view.GetSampleLabel().empty(); });
 }
@@ -29,20 +32,19 @@ std::vector<TElement> TRuleRun::TryElements(std::string const& className) const 
 
 std::vector<TElement> TRuleRun::Elements(std::string const& className) {
   std::vector<TElement> elements = TryElements(className);
-  if (!elements.empty()) return elements;
-
   if (IsOfSample(fViews)) {
-    NoteNotAsked({"the sample does not describe them", ""});
+    if (elements.empty()) NoteNotAsked({"the sample does not describe them", ""});
     return elements;
   }
   TMissing why{kMissingNotDescribed, "no provider describes " + className};
-  bool isKnownToBeNone = false;
+  bool isAnswered = !elements.empty();
   for (TNamespaceView const& view : fViews) {
-    if (!view.FindClass(className)) continue;
+    if (!view.FindClass(className) || !view.InstancesOf(className).empty()) continue;
     why = view.WhyNoInstance(className);
-    isKnownToBeNone = isKnownToBeNone || MeansNone(why);
+    isAnswered = isAnswered || MeansNone(why) || MayHide(why);
+    if (MayHide(why)) NoteNotAsked({why.fReason, ""});
   }
-  if (!isKnownToBeNone) NoteNotAsked({why.fReason, ""});
+  if (!isAnswered) NoteNotAsked({why.fReason, ""});
   return elements;
 }
 

@@ -468,6 +468,27 @@ TEST(RulesTest, ARuleWhoseSourceIsMissingIsNotAsked) {
   }
 }
 
+// A provider that has read instances, or found none, beside one that could not read its own.
+TEST(RulesTest, AProviderThatCouldNotReadItsInstancesIsNotedBesideAnother) {
+  auto const reasonsBeside = [](std::string const& first, char const* code) {
+    std::vector<TNamespaceView> views;
+    for (std::string const& instances : {first, Missing("CIM_NumericSensor", "", code)}) {
+      auto const ns = boost::make_shared<TMemoryNamespace>("root/test");
+      ReadMofText(kRuleClasses, "classes", ns);
+      ReadMofText(instances, "instances", ns);
+      views.emplace_back("Test", ns);
+    }
+    std::vector<std::string> reasons;
+    for (TNotAsked const& notAsked : ResultOf("fan-stopped", MakeFindings(views)).fNotAsked) reasons.push_back(notAsked.fReason);
+    return reasons;
+  };
+  EXPECT_THAT(reasonsBeside(Sensor(kTemperature, "Normal"), "needs-root"), ElementsAre("a reason"));
+  EXPECT_THAT(reasonsBeside(Sensor(kFan, "Normal"), "needs-root"), ElementsAre("a reason"));
+  EXPECT_THAT(reasonsBeside("", "needs-root"), ElementsAre("a reason"));
+  EXPECT_THAT(reasonsBeside(Sensor(kFan, "Normal"), "no-source"), IsEmpty()) << "the machine has no controller";
+  EXPECT_THAT(reasonsBeside(Sensor(kTemperature, "Normal"), "no-source"), ElementsAre("no sensor measures the speed of a fan"));
+}
+
 TEST(RulesTest, WithoutProvidersNoRuleCanBeAskedButThatOfPlugIns) {
   auto const findings = MakeFindings({});
   EXPECT_THAT(findings.fProblems, IsEmpty());
