@@ -33,6 +33,25 @@ void AskSensors(TRuleRun& run) {
   }
 }
 
+// Whether the sensor is the controller's. Its firmware lists the fans that the machine has; the chips of hwmon count the pulses
+// at every header, with a lowest speed of their own.
+bool IsOfController(TElement const& sensor) { return sensor.NameIn("DeviceID").rfind("ipmi ", 0) == 0; }
+
+void JudgeFan(TRuleRun& run, TElement const& fan, TAnswer<std::string> const& state) {
+  auto const reading = fan.Text("CurrentReading");
+  bool const isSlow = Contains(*state.fValue, "Lower"), isCritical = isSlow && !Contains(*state.fValue, "Non-Critical");
+  bool const stands = isSlow && reading.IsKnown() && *reading.fValue == "0";
+  std::string const name = "the fan " + fan.Label();
+  if (*state.fValue == "Fault" || (stands && (isCritical || IsOfController(fan))))
+    run.Add(fan, state.fSource, ESeverity::kError, name + " has stopped or is broken", "Replace the fan.");
+  else if (stands)
+    run.Add(fan, state.fSource, ESeverity::kWarning, name + " does not turn, or is not connected",
+            "If a fan is connected there, replace it; otherwise set its lowest speed to 0 (fan*_min in /sys/class/hwmon).");
+  else if (isCritical)
+    run.Add(fan, state.fSource, ESeverity::kError, name + " is too slow (" + *state.fValue + ")",
+            "Clean the fan, or replace it.");
+}
+
 void AskFans(TRuleRun& run) {
   NoteUnread(run, "sensors");
   auto const sensors = run.Elements("CIM_NumericSensor");
@@ -40,15 +59,8 @@ void AskFans(TRuleRun& run) {
   if (!sensors.empty() && !hasFan && run.GetNotAsked().empty()) run.NoteNotAsked({"no sensor measures the speed of a fan", ""});
   for (TElement const& sensor : sensors) {
     if (!Is(sensor, kTachometer)) continue;
-    auto const state = sensor.Text("CurrentState"), reading = sensor.Text("CurrentReading");
-    if (!run.Know(sensor, state)) continue;
-    bool const hasStopped = Contains(*state.fValue, "Lower") && reading.IsKnown() && *reading.fValue == "0";
-    if (hasStopped || *state.fValue == "Fault")
-      run.Add(sensor, state.fSource, ESeverity::kError, "the fan " + sensor.Label() + " has stopped or is broken",
-              "Replace the fan.");
-    else if (Contains(*state.fValue, "Lower") && !Contains(*state.fValue, "Non-Critical"))
-      run.Add(sensor, state.fSource, ESeverity::kError, "the fan " + sensor.Label() + " is too slow (" + *state.fValue + ")",
-              "Clean the fan, or replace it.");
+    auto const state = sensor.Text("CurrentState");
+    if (run.Know(sensor, state)) JudgeFan(run, sensor, state);
   }
 }
 

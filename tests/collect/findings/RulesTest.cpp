@@ -279,12 +279,20 @@ TEST(RulesTest, SensorsAreJudgedByTheirState) {
 }
 
 TEST(RulesTest, AFanThatDoesNotTurnAlthoughItShouldIsNamed) {
-  std::string const rule = "fan-stopped", reason = "error: the fan S1 has stopped or is broken";
-  EXPECT_THAT(Problems(rule, Sensor(kFan, "Lower Non-Critical", 0)), ElementsAre(reason));
-  EXPECT_THAT(Problems(rule, Sensor(kFan, "Fault", 900)), ElementsAre(reason));
+  std::string const rule = "fan-stopped", stopped = "error: the fan S1 has stopped or is broken";
+  EXPECT_THAT(Problems(rule, Sensor(kFan, "Lower Critical", 0)), ElementsAre(stopped));
+  EXPECT_THAT(Problems(rule, Sensor(kFan, "Fault", 900)), ElementsAre(stopped));
   EXPECT_THAT(Problems(rule, Sensor(kFan, "Normal", 0)), IsEmpty()) << "it has no lowest speed: it may stand still";
   EXPECT_THAT(Problems(rule, Sensor(kFan, "Lower Non-Critical", 200)), IsEmpty());
   EXPECT_THAT(Problems(rule, Sensor(kFan, "Lower Critical", 200)), ElementsAre("error: the fan S1 is too slow (Lower Critical)"));
+}
+
+TEST(RulesTest, AHeaderWithoutAFanIsAWarningUnlessTheControllerListsTheFan) {
+  std::string const ofBoard = Sensor(kFan, "Lower Non-Critical", 0);
+  EXPECT_THAT(Problems("fan-stopped", ofBoard), ElementsAre("warning: the fan S1 does not turn, or is not connected"));
+  std::string ofController = ofBoard;
+  ofController.replace(ofController.find("\"1\""), 3, "\"ipmi 0x20 0x31\"");
+  EXPECT_THAT(Problems("fan-stopped", ofController), ElementsAre("error: the fan S1 has stopped or is broken"));
 }
 
 std::string Supply(char const* name, char const* status) {

@@ -71,6 +71,7 @@ protected:
     }
     Write(kSensor + "fan1_input", "900\n");
     Write(kSensor + "fan1_min", "500\n");
+    Write(kSensor + "fan1_fault", "0\n");
     Write(kModules + "dimm0/dimm_label", "DIMM_A1\n");
     for (char const* count : {"ce", "ue"}) Write(kModules + "dimm0/dimm_" + count + "_count", "0\n");
     Write("dev/kmsg", ReadFile(TestDataPath("kmsg/healthy")));
@@ -210,7 +211,8 @@ TEST_F(RecordedFaultsTest, OfSensorsAndMemory) {
   TRow const rows[] = {
       {"error sensor-threshold", "air flow", {{kSensor + "temp1_input", Content("100850\n")}}},
       {"warning sensor-threshold", "air flow", {{kSensor + "temp1_input", Content("75850\n")}}},
-      {"error fan-stopped", "Replace the fan", {{kSensor + "fan1_input", Content("0\n")}}},
+      {"warning fan-stopped", "If a fan is connected", {{kSensor + "fan1_input", Content("0\n")}}},
+      {"error fan-stopped", "Replace the fan", {{kSensor + "fan1_fault", Content("1\n")}}},
       {"error power-supply-lost", "cable", {{kSupply + "PSU2/online", Content("0\n")}}},
       {"critical memory-errors", "Replace the memory module", {{kModules + "dimm0/dimm_ue_count", Content("1\n")}}},
       {"warning memory-errors", "Watch the number", {{kModules + "dimm0/dimm_ce_count", Content("101\n")}}},
