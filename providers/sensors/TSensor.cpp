@@ -93,10 +93,15 @@ private:
   TKindOfFile const& fKind;
 };
 
+// A processor at full load may reach its "temp*_max": from there on, its cooling should run at full power.
+bool HasMaximumOfCooling(std::string const& chip) { return chip.rfind("coretemp ", 0) == 0; }
+
 TSensor SensorOf(TSensorFiles const& sensor, std::string const& chip, std::string const& path, std::string const& name,
                  TKindOfFile const& kind) {
   bool const isPower = kind.fKind == EKind::kPower;  // "power1_cap" is the limit that the chip itself keeps
   auto lower = sensor.Threshold("_min"), upper = sensor.Threshold(isPower ? "_cap" : "_max");
+  if (upper && HasMaximumOfCooling(chip))
+    upper = TMissing{kMissingNotApplicable, path + "_max is where the fans should be at full speed, and not a threshold"};
   if (lower && upper && *lower >= *upper)  // some chips begin with the same value in both
     lower = upper = TMissing{kMissingPlaceholder, path + "_min is not below the upper threshold: neither is set"};
   return {chip,

@@ -36,21 +36,38 @@ protected:
 };
 
 TEST_F(TSensorTest, ASensorHasItsChipLabelReadingAndThresholds) {
-  Chip("hwmon3", "coretemp", "coretemp.0");
-  Write("hwmon3", "temp2_label", "Core 0");
+  Chip("hwmon3", "jc42", "0-0018");
+  Write("hwmon3", "temp2_label", "DIMM 0");
   Write("hwmon3", "temp2_input", "45000");
   Write("hwmon3", "temp2_max", "84000");
   Write("hwmon3", "temp2_crit", "100000");
   Write("hwmon3", "temp2_crit_alarm", "0");
   TSensor const sensor = Only();
-  EXPECT_EQ(sensor.fChip, "coretemp coretemp.0");
+  EXPECT_EQ(sensor.fChip, "jc42 0-0018");
   EXPECT_EQ(sensor.fName, "temp2");
-  EXPECT_EQ(*sensor.fLabel, "Core 0");
+  EXPECT_EQ(*sensor.fLabel, "DIMM 0");
   EXPECT_EQ(*sensor.fReading, 45000);
   EXPECT_EQ(*sensor.fUpperNonCritical, 84000);
   EXPECT_EQ(*sensor.fUpperCritical, 100000);
   EXPECT_EQ(sensor.fUpperFatal.Why().fCode, kMissingNotGiven);
   EXPECT_EQ(*StateOf(sensor), "Normal");
+}
+
+TEST_F(TSensorTest, AProcessorMayBeAsWarmAsItsCoolingAllows) {
+  Chip("hwmon0", "coretemp", "coretemp.0");
+  Chip("hwmon1", "jc42", "0-0018");
+  for (char const* const hwmon : {"hwmon0", "hwmon1"}) {
+    Write(hwmon, "temp1_input", "90000");
+    Write(hwmon, "temp1_max", "84000");
+    Write(hwmon, "temp1_crit", "100000");
+  }
+  auto const sensors = Sensors();
+  ASSERT_EQ(sensors.size(), 2u);
+  EXPECT_EQ(sensors[0].fUpperNonCritical.Why().fCode, kMissingNotApplicable);
+  EXPECT_EQ(*StateOf(sensors[0]), "Normal");
+  EXPECT_EQ(*StateOf(sensors[1]), "Upper Non-Critical");
+  Write("hwmon0", "temp1_input", "100000");
+  EXPECT_EQ(*StateOf(Sensors()[0]), "Upper Critical");
 }
 
 TEST_F(TSensorTest, KindsAreKnownByTheNamesOfTheFiles) {
