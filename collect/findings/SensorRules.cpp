@@ -87,16 +87,22 @@ void AskPowerSupplies(TRuleRun& run) {
   }
 }
 
+// The errors that the memory controller could not assign to a module have no place.
+std::string FaultyModule(TElement const& errors) {
+  bool const isOfModule = !errors.Value("Location").IsNotApplicable();
+  return isOfModule ? "the memory module" : "the faulty memory module (a memory test or the controller's event log may name it)";
+}
+
 void AskMemoryErrors(TRuleRun& run) {
   for (TElement const& errors : run.Elements("ZEP_MemoryErrors")) {
     auto const corrected = errors.Number("CorrectedErrors"), uncorrected = errors.Number("UncorrectedErrors");
-    std::string const place = "the memory " + errors.Label() + " has had ";
+    std::string const place = "the memory " + errors.Label() + " has had ", module = FaultyModule(errors);
     if (run.Know(errors, uncorrected) && *uncorrected.fValue > 0)
       run.Add(errors, uncorrected.fSource, ESeverity::kCritical,
-              place + "uncorrected errors: " + std::to_string(*uncorrected.fValue), "Replace the memory module.");
+              place + "uncorrected errors: " + std::to_string(*uncorrected.fValue), "Replace " + module + ".");
     if (run.Know(errors, corrected) && *corrected.fValue > run.Thresholds().fCorrectedMemoryErrors)
       run.Add(errors, corrected.fSource, ESeverity::kWarning, place + "corrected errors: " + std::to_string(*corrected.fValue),
-              "Watch the number, and replace the memory module if it grows.");
+              "Watch the number, and replace " + module + " if it grows.");
   }
 }
 

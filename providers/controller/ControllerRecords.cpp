@@ -130,7 +130,7 @@ TRecord ControllerRecord(TController const& controller, TComputerSystem const& s
   record.Add("Manufacturer", id.Then(MakerOf));
   record.Add("ManufacturerID", id.Then([](TDeviceId const& known) { return known.fManufacturer; }));
   record.Add("ProductID", id.Then([](TDeviceId const& known) { return known.fProduct; }));
-  record.SetSource("IPMI Get Device GUID");
+  record.SetSource("IPMI Get System GUID");
   record.Add("GUID", controller.fGuid);
   record.SetSource("IPMI");
   record.Add("UnreadParts", Known(UnreadPartsOf(controller)));

@@ -325,6 +325,17 @@ TEST(RulesTest, ErrorsOfMemoryAndPciDevicesAreCounted) {
                           "warning: the PCI Express device 01:00.0 has had corrected errors: 1001"));
 }
 
+TEST(RulesTest, ErrorsOfNoModuleHaveARemedyOfTheirOwn) {
+  std::string const errors = "instance of ZEP_MemoryErrors { InstanceID = \"1\"; CorrectedErrors = 0; UncorrectedErrors = 2; };";
+  auto const remedyOf = [&](char const* code) {
+    auto const problems = FindingsOf(errors + Missing("ZEP_MemoryErrors.InstanceID=\\\"1\\\"", "Location", code)).fProblems;
+    return problems.size() == 1 ? problems[0].fRemedy : "";
+  };
+  EXPECT_EQ(remedyOf("not-given"), "Replace the memory module.");
+  EXPECT_EQ(remedyOf("not-applicable"),
+            "Replace the faulty memory module (a memory test or the controller's event log may name it).");
+}
+
 // ---- Host ----
 
 TEST(RulesTest, ProcessorsOfDifferentSteppingOrMicrocodeAreNamed) {

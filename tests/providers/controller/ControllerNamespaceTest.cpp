@@ -109,6 +109,14 @@ TEST_F(ControllerNamespaceTest, AnEntryNamesAllItsSources) {
   EXPECT_EQ(sources["RecordData"], "IPMI Get SEL Entry, sensor data records");
 }
 
+TEST_F(ControllerNamespaceTest, TheGuidIsThatOfTheSystem) {  // command 0x37; that of the device is command 0x08
+  std::string source;
+  TRecord const record = ControllerRecord({}, TComputerSystem(TMachineFiles(fDir.Path())));
+  for (TRecordProperty const& property : record.GetProperties())
+    if (property.fName == "GUID") source = property.fSource;
+  EXPECT_EQ(source, "IPMI Get System GUID");
+}
+
 TEST_F(ControllerNamespaceTest, AnEntryInAFormOfTheMakerDoesNotEndAState) {
   std::string const event = SelEvent(0, 1, 0x30, 1, 0x59, 91, 90);
   std::string makers = SelEvent(1, 1, 0x30, 0x81, 0x59, 91, 90);  // at the same places as in the end of the event
