@@ -35,10 +35,10 @@ void WriteAll(TRecordWriter& writer, TFinding<std::vector<TElement>> const& elem
 
 // A sensor that several records describe has one instance.
 void WriteSensors(TRecordWriter& writer, TController const& controller, TComputerSystem const& system) {
-  std::set<std::pair<int, int>> seen;
+  std::set<std::tuple<int, int, int>> seen;
   TRecords withStates, withNumbers;
   for (TSensorState const& state : controller.fSensors) {
-    if (!seen.insert({state.fSensor.fOwner, state.fSensor.fNumber}).second) continue;
+    if (!seen.insert({state.fSensor.fOwner, state.fSensor.fLun, state.fSensor.fNumber}).second) continue;
     if (state.fSensor.fScale.HasNumber())
       withNumbers.push_back(NumericSensorRecord(state, system));
     else
@@ -72,11 +72,13 @@ void WritePackages(TRecordWriter& writer, TController const& controller) {
 
 // Common to an event and the later end of its state.
 auto StateOf(TSelEntry const& entry) {
-  return std::make_tuple(entry.fOwner, entry.fSensorType, entry.fSensorNumber, entry.fEventType, entry.fData[0] & 0x0F);
+  return std::make_tuple(entry.fOwner, entry.fLun, entry.fSensorType, entry.fSensorNumber, entry.fEventType,
+                         entry.fData[0] & 0x0F);
 }
 
 bool IsOf(TSelEntry const& entry, TSdrSensor const& sensor) {
-  return entry.fKind == TSelEntry::EKind::kEvent && sensor.fOwner == entry.fOwner && sensor.fNumber == entry.fSensorNumber;
+  return entry.fKind == TSelEntry::EKind::kEvent && sensor.fOwner == entry.fOwner && sensor.fLun == entry.fLun &&
+         sensor.fNumber == entry.fSensorNumber;
 }
 
 TSdrSensor const* SensorOf(TSelEntry const& entry, TController const& controller) {

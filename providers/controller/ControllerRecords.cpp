@@ -23,6 +23,12 @@ TFinding<TCIMDateTime> PointInTime(std::uint64_t secondsSince1970) { return Date
 
 std::string Hex(std::uint8_t byte) { return "0x" + HexText(std::string(1, static_cast<char>(byte))); }
 
+// DeviceID of a sensor. Most controllers use only LUN 0.
+std::string SensorIdOf(std::uint8_t owner, std::uint8_t lun, std::uint8_t number) {
+  std::string const ofLun = lun == 0 ? "" : "LUN " + std::to_string(lun) + " ";
+  return "ipmi " + Hex(owner) + " " + ofLun + Hex(number);
+}
+
 TFinding<std::string> MakerOf(TDeviceId const& id) {
   std::string const name = MakerName(id.fManufacturer);
   if (name.empty()) return TMissing{kMissingNotGiven, "libfreeipmi knows no maker with this number"};
@@ -56,7 +62,7 @@ std::vector<std::string> UnreadPartsOf(TController const& controller) {
 TRecord SensorRecord(char const* className, TSensorState const& state, TComputerSystem const& system) {
   TSdrSensor const& sensor = state.fSensor;
   TRecord record(className, "IPMI sensor data records");
-  system.AddDeviceKeys(record, "ipmi " + Hex(sensor.fOwner) + " " + Hex(sensor.fNumber));
+  system.AddDeviceKeys(record, SensorIdOf(sensor.fOwner, sensor.fLun, sensor.fNumber));
   record.Add("ElementName", Known(LabelOf(sensor)));
   record.Add("SensorType", Known(NumbersOf(sensor).fSensorType)).Names(kSensorTypeNames);
   record.Add("OtherSensorTypeDescription", Known(SensorTypeName(sensor.fType)));

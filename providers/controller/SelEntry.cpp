@@ -28,6 +28,7 @@ std::optional<TSelEntry> SelEntryFrom(std::string_view bytes) {
   entry.fBytes = bytes.substr(0, kSelEntryLength);
   if (entry.fKind != TSelEntry::EKind::kEvent) return entry;
   entry.fOwner = record.At(7);
+  entry.fLun = record.At(8) & 0x03;
   entry.fSensorType = record.At(10);
   entry.fSensorNumber = record.At(11);
   entry.fEventType = record.At(12) & 0x7F;

@@ -21,8 +21,8 @@ struct TSelEntry {
   std::uint32_t fTime = 0;  // as the controller reports it; see SelTimeFrom
 
   // Only of an event:
-  std::uint8_t fOwner = 0, fSensorType = 0, fSensorNumber = 0, fEventType = 0;
-  bool fIsDeasserted = false;  // the state has ended
+  std::uint8_t fOwner = 0, fLun = 0, fSensorType = 0, fSensorNumber = 0, fEventType = 0;  // LUN: of the owner
+  bool fIsDeasserted = false;                                                             // the state has ended
   std::uint8_t fData[3] = {};
 
   std::string fBytes;  // all 16

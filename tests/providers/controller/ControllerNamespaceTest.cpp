@@ -143,6 +143,20 @@ TEST_F(ControllerNamespaceTest, AnEventHasTheNameOfASensorThatOnlyReportsEvents)
   EXPECT_THAT(text, Not(HasSubstr("  CurrentState: <")));
 }
 
+TEST_F(ControllerNamespaceTest, SensorsOfTwoLunsStayApart) {
+  constexpr std::size_t lunOfRecord = 6, lunOfEvent = 8;
+  std::string other = CompactSensorRecord(3, 0x51, 8, "PSU 9"), end = SelEvent(1, 8, 0x51, 0x6F | 0x80, 1);
+  other[lunOfRecord] = end[lunOfEvent] = 1;
+  fController.fRecords.push_back(other);
+  fController.fEvents = {SelEvent(0, 8, 0x51, 0x6F, 1), end};
+  std::string const text = Fill();
+  EXPECT_THAT(text, HasSubstr("DeviceID=\"ipmi 0x20 0x51\""));
+  EXPECT_THAT(text, HasSubstr("DeviceID=\"ipmi 0x20 LUN 1 0x51\""));
+  EXPECT_THAT(text, HasSubstr("  RecordData: PSU 1: Power Supply Failure detected, asserted\n"));
+  EXPECT_THAT(text, HasSubstr("  RecordData: PSU 9: Power Supply Failure detected, deasserted\n"));
+  EXPECT_THAT(text, HasSubstr("HasEnded: false")) << "the end is that of the other sensor";
+}
+
 TEST_F(ControllerNamespaceTest, AThresholdEventOfASensorThatIsWithinItHasEnded) {
   fController.fEvents = {SelEvent(0, 1, 0x30, 1, 0x59, 91, 90)};  // upper critical, going high; its end is not in the log
   EXPECT_THAT(Fill(), Not(HasSubstr("HasEnded: true"))) << "the sensor is beyond it";
