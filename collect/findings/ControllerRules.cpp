@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
+#include "collect/findings/AgeText.h"
 #include "collect/findings/ControllerElements.h"
 #include "collect/findings/Findings.h"
 #include "collect/findings/Rules.h"
@@ -55,22 +56,30 @@ bool IsAbsent(std::string const& type, std::string const& state, bool isError) {
   return state == kAbsent || (isSupply && !Contains(state, kPresent) && !Contains(state, kInserted));
 }
 
-// Whether the event log records that the part was removed. A bay that was never used has no such entry.
-bool WasRemoved(TRuleRun const& run, std::string const& part) {
-  std::string const removals[] = {part + ": " + kPresent + ", deasserted", part + ": " + kInserted + ", deasserted",
-                                  part + ": " + kAbsent + ", asserted"};
+bool IsRemoval(std::string const& text) {
+  std::string const removals[] = {std::string(": ") + kPresent + ", deasserted", std::string(": ") + kInserted + ", deasserted",
+                                  std::string(": ") + kAbsent + ", asserted"};
+  return std::any_of(std::begin(removals), std::end(removals),
+                     [&](std::string const& removal) { return Contains(text, removal.c_str()); });
+}
+
+// Whether the event log records that the part of the sensor was removed. A bay that was never used has no such entry. Sensors are
+// compared by DeviceID, because some controllers give the same name to the sensors of all parts.
+bool WasRemoved(TRuleRun& run, TElement const& sensor) {
+  std::string const id = sensor.NameIn("DeviceID");
   auto const entries = run.TryElements("ZEP_EventLogEntry");
   return std::any_of(entries.begin(), entries.end(), [&](TElement const& entry) {
     auto const text = entry.Text("RecordData");
-    return text.IsKnown() && std::any_of(std::begin(removals), std::end(removals),
-                                         [&](std::string const& removal) { return text.fValue->rfind(removal, 0) == 0; });
+    auto const age = entry.Number("Age");
+    if (!text.IsKnown() || !IsRemoval(*text.fValue) || entry.NameIn("SensorDeviceID") != id) return false;
+    return run.Know(entry, age) && *age.fValue <= run.Thresholds().fEventLogDays * kSecondsOfADay;
   });
 }
 
 void JudgeState(TRuleRun& run, TElement const& sensor, std::string const& type, TAnswer<std::string> const& state, bool isError) {
   std::string const part = sensor.Label() + " (" + type + ")";
   if (IsAbsent(type, *state.fValue, isError)) {
-    if (WasRemoved(run, sensor.Label()))
+    if (WasRemoved(run, sensor))
       run.Add(sensor, state.fSource, ESeverity::kError, part + " is missing: the controller's event log records its removal",
               "Insert it again. If it was removed on purpose, clear the event log (ipmitool sel clear).");
   } else if (isError) {

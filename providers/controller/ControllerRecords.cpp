@@ -117,6 +117,11 @@ TFinding<std::string> SensorTypeNameOf(TSelEntry const& entry) {
   return TMissing{kMissingNotApplicable, "the entry is in a form of the maker"};
 }
 
+TFinding<std::string> SensorIdOf(TSelEntry const& entry) {
+  if (entry.fKind == TSelEntry::EKind::kEvent) return SensorIdOf(entry.fOwner, entry.fLun, entry.fSensorNumber);
+  return TMissing{kMissingNotApplicable, "the entry is in a form of the maker"};
+}
+
 std::string EventLabelOf(TLoggedEvent const& event) {
   if (event.fSensor != nullptr) return LabelOf(*event.fSensor);
   return event.fEntry.fKind == TSelEntry::EKind::kEvent ? "sensor " + Hex(event.fEntry.fSensorNumber) : "maker's entry";
@@ -242,6 +247,7 @@ TRecord EntryRecord(TLoggedEvent const& event) {
   record.Add("RecordData", Known(label + ": " + EventText(event.fEntry, event.fSensor)));
   record.SetSource(kEntry);
   record.Add("SensorTypeName", SensorTypeNameOf(event.fEntry));
+  record.Add("SensorDeviceID", SensorIdOf(event.fEntry));
   record.SetSource("IPMI Get SEL Entry, Get SEL Time");
   record.Add("Age", event.fAge).Unit("second");
   record.SetSource("IPMI Get SEL Entry, Get Sensor Reading");

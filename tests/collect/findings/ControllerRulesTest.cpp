@@ -123,17 +123,21 @@ std::string PartIn(std::string const& type, std::string const& state, int status
                       "}; };");
 }
 
-std::string Logged(std::string const& text) {
-  return "instance of ZEP_EventLogEntry { RecordID = \"1\"; RecordData = \"" + text + "\"; };";
+std::string Logged(std::string const& text, std::string const& sensor = "s", int age = 10) {
+  return "instance of ZEP_EventLogEntry { RecordID = \"1\"; RecordData = \"" + text + "\"; SensorDeviceID = \"" + sensor +
+         "\"; Age = " + std::to_string(age) + "; };";
 }
 
 TEST(ControllerRulesTest, APowerSupplyThatWasRemovedIsMissing) {
-  std::string const rule = "controller-part-failed", removal = Logged("PSU 1: Presence detected, deasserted");
-  EXPECT_THAT(Problems(rule, PartIn("Power Supply", "none") + removal),
+  std::string const rule = "controller-part-failed", text = "PSU 1: Presence detected, deasserted", removal = Logged(text);
+  std::string const bay = PartIn("Power Supply", "none");
+  EXPECT_THAT(Problems(rule, bay + removal),
               ElementsAre("error: PSU 1 (Power Supply) is missing: the controller's event log records its removal"));
   EXPECT_THAT(Problems(rule, PartIn("Power Supply", "Presence detected") + removal), IsEmpty()) << "inserted again";
-  EXPECT_THAT(Problems(rule, PartIn("Power Supply", "none")), IsEmpty()) << "the bay was never used";
-  EXPECT_THAT(Problems(rule, PartIn("Power Supply", "none") + Logged("PSU 12: Presence detected, deasserted")), IsEmpty());
+  EXPECT_THAT(Problems(rule, bay), IsEmpty()) << "the bay was never used";
+  EXPECT_THAT(Problems(rule, bay + Logged("PSU 1: Presence detected, asserted")), IsEmpty());
+  EXPECT_THAT(Problems(rule, bay + Logged(text, "another sensor of this name")), IsEmpty());
+  EXPECT_THAT(Problems(rule, bay + Logged(text, "s", 31 * kDay)), IsEmpty()) << "long ago";
   EXPECT_THAT(Problems(rule, PartIn("Drive Slot", "none") + removal), IsEmpty());
 }
 

@@ -52,7 +52,8 @@ inline constexpr char const* kRuleClasses = R"(
   class ZEP_ControllerAccount { [key] string Name; string UserID; uint16 EnabledState; string Privilege; boolean HasLANAccess; };
   class ZEP_EventLog { [key] string InstanceID; uint64 CurrentNumberOfRecords; [ValueSource("free")] uint64 FreeRecords;
     [ValueSource("lost")] boolean HasLostRecords; datetime ClockTime; };
-  class ZEP_EventLogEntry { [key] string RecordID; string RecordData; uint16 PerceivedSeverity; uint64 Age; boolean HasEnded; };
+  class ZEP_EventLogEntry { [key] string RecordID; string RecordData; string SensorTypeName; string SensorDeviceID;
+    uint16 PerceivedSeverity; uint64 Age; boolean HasEnded; };
   class ZEP_MemoryErrors { [key] string InstanceID; string ElementName; string Location; uint64 CorrectedErrors; uint64 UncorrectedErrors; };
   class ZEP_PCIErrors { [key] string InstanceID; string ElementName; uint64 CorrectableErrors; uint64 NonFatalErrors;
     uint64 FatalErrors; };

@@ -131,6 +131,7 @@ TEST_F(ControllerNamespaceTest, AnEntryInAFormOfTheMakerDoesNotEndAState) {
             "  PerceivedSeverity: 0\n"
             "  RecordData: maker's entry: entry in a form of the maker: 01 00 c0 80 44 17 60 20 00 04 01 30 81 59 5b 5a\n"
             "  SensorTypeName: <the entry is in a form of the maker>\n"
+            "  SensorDeviceID: <the entry is in a form of the maker>\n"
             "  Age: 0\n"
             "  HasEnded: false\n");
 }
@@ -152,6 +153,8 @@ TEST_F(ControllerNamespaceTest, SensorsOfTwoLunsStayApart) {
   std::string const text = Fill();
   EXPECT_THAT(text, HasSubstr("DeviceID=\"ipmi 0x20 0x51\""));
   EXPECT_THAT(text, HasSubstr("DeviceID=\"ipmi 0x20 LUN 1 0x51\""));
+  EXPECT_THAT(text, HasSubstr("  SensorDeviceID: ipmi 0x20 0x51\n"));
+  EXPECT_THAT(text, HasSubstr("  SensorDeviceID: ipmi 0x20 LUN 1 0x51\n"));
   EXPECT_THAT(text, HasSubstr("  RecordData: PSU 1: Power Supply Failure detected, asserted\n"));
   EXPECT_THAT(text, HasSubstr("  RecordData: PSU 9: Power Supply Failure detected, deasserted\n"));
   EXPECT_THAT(text, HasSubstr("HasEnded: false")) << "the end is that of the other sensor";
