@@ -6,6 +6,7 @@
 #include "providers/reasons/TRecordWriter.h"
 
 #include <algorithm>
+#include <iterator>
 #include <set>
 #include <tuple>
 
@@ -89,13 +90,31 @@ TSdrSensor const* SensorOf(TSelEntry const& entry, TController const& controller
   return nullptr;
 }
 
-// Whether the entry is about a threshold, and the sensor is within it now. Many controllers do not log the end of such a state.
-bool IsWithinThreshold(TSelEntry const& entry, TController const& controller) {
-  if (entry.fEventType != kThresholdReading) return false;
-  unsigned const place = (entry.fData[0] & 0x0FU) / 2;  // TRawThresholds::EPlace; each has an event for either direction
-  return std::any_of(controller.fSensors.begin(), controller.fSensors.end(), [&](TSensorState const& state) {
-    return IsOf(entry, state.fSensor) && state.fStates && (*state.fStates >> place & 1) == 0;
-  });
+// Whether a state bit of such a sensor is set as long as its state lasts. Those of other types, such as memory and interrupts,
+// may be cleared when they were read.
+bool HasLastingStates(std::uint8_t sensorType) {
+  constexpr std::uint8_t types[] = {0x01, 0x02, 0x03, 0x04,        // temperature, voltage, current, fan
+                                    0x05,                          // physical security
+                                    0x08, 0x09, 0x0A, 0x0D,        // power supply, power unit, cooling device, drive slot
+                                    0x15, 0x17, 0x1B, 0x21, 0x25,  // board, card, cable, slot, presence of a part
+                                    0x29};                         // battery
+  return std::find(std::begin(types), std::end(types), sensorType) != std::end(types);
+}
+
+// Whether the sensor can report the state of the event, and is not in it now.
+bool IsOutOfState(TSensorState const& sensor, TSelEntry const& entry) {
+  if (!sensor.fStates || sensor.fSensor.fReadingType != entry.fEventType) return false;
+  unsigned const state = entry.fData[0] & 0x0FU;
+  auto const isSet = [](std::uint16_t bits, unsigned place) { return (bits >> place & 1) != 0; };
+  if (entry.fEventType == kThresholdReading)
+    return !isSet(*sensor.fStates, state / 2);  // TRawThresholds::EPlace; each has an event for either direction
+  return HasLastingStates(entry.fSensorType) && isSet(sensor.fSensor.fReadableStates, state) && !isSet(*sensor.fStates, state);
+}
+
+// Many controllers do not log the end of a state, or log it as another state: "Redundancy Lost", then "Fully Redundant".
+bool IsOver(TSelEntry const& entry, TController const& controller) {
+  return std::any_of(controller.fSensors.begin(), controller.fSensors.end(),
+                     [&](TSensorState const& sensor) { return IsOf(entry, sensor.fSensor) && IsOutOfState(sensor, entry); });
 }
 
 TFinding<std::uint64_t> AgeOf(TSelEntry const& entry, TFinding<std::uint64_t> const& clock) {
@@ -117,7 +136,7 @@ std::vector<TLoggedEvent> EventsOf(TEventLog const& log, TController const& cont
   std::for_each(log.fEntries.rbegin(), log.fEntries.rend(), [&](TSelEntry const& entry) {
     bool const isEvent = entry.fKind == TSelEntry::EKind::kEvent;
     if (isEvent && entry.fIsDeasserted) ended.insert(StateOf(entry));
-    bool const hasEnded = isEvent && (ended.count(StateOf(entry)) > 0 || IsWithinThreshold(entry, controller));
+    bool const hasEnded = isEvent && (ended.count(StateOf(entry)) > 0 || IsOver(entry, controller));
     if (seen.insert(entry.fId).second) events.push_back({entry, SensorOf(entry, controller), AgeOf(entry, log.fClock), hasEnded});
   });
   std::reverse(events.begin(), events.end());

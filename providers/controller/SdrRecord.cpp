@@ -61,6 +61,8 @@ TSdrSensor SensorOf(TBytes const& record, TSdrSensor::EKind kind) {
   std::size_t const types = kind == TSdrSensor::EKind::kEventOnly ? 10 : 12;
   sensor.fType = record.At(types);
   sensor.fReadingType = record.At(types + 1) & 0x7F;
+  bool const hasStates = kind != TSdrSensor::EKind::kEventOnly && sensor.fReadingType != kThresholdReading;
+  if (hasStates) sensor.fReadableStates = record.Word(18) & 0x7FFF;
   return sensor;
 }
 

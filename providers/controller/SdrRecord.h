@@ -55,9 +55,10 @@ struct TSdrSensor {
   TSensorScale fScale = {};
   TRawThresholds fThresholds = {};  // as the repository has them
   TFinding<std::string> fName = TMissing{};
-  std::uint8_t fSharers = 1;  // sensors that the record describes, with numbers from fNumber on
-  bool fHasLetters = false;   // whether their names end in letters and not in numbers
-  std::uint8_t fOffset = 0;   // of the first number or letter
+  std::uint8_t fSharers = 1;          // sensors that the record describes, with numbers from fNumber on
+  bool fHasLetters = false;           // whether their names end in letters and not in numbers
+  std::uint8_t fOffset = 0;           // of the first number or letter
+  std::uint16_t fReadableStates = 0;  // of a sensor without thresholds: a bit for each state that its reading can have
 };
 
 // The sensors that the record of this one describes. If there are several, the name of each ends in a number or letter of its

@@ -144,6 +144,52 @@ TEST_F(ControllerNamespaceTest, AnEventHasTheNameOfASensorThatOnlyReportsEvents)
   EXPECT_THAT(text, Not(HasSubstr("  CurrentState: <")));
 }
 
+TEST_F(ControllerNamespaceTest, AnEventWhoseStateIsOverHasEnded) {
+  constexpr int redundancy = 0x0B, severity = 0x07, specific = 0x6F, critical = 2;
+  constexpr std::size_t typeOfRecord = 13;
+  struct TRow {
+    int fSensorType, fEventType, fState, fStates;  // of the event, and the bits that the sensor has now
+    bool fHasEnded;
+  };
+  TRow const rows[] = {
+      {8, redundancy, 1, 0x01, true},       // "Redundancy Lost"; now "Fully Redundant"
+      {8, redundancy, 1, 0x02, false},      // still lost
+      {9, severity, critical, 0x01, true},  // "Transition to Critical"; now "OK"
+      {9, severity, critical, 0x04, false},
+      {8, specific, 1, 0x01, true},  // power supply failure; now only present
+      {8, specific, 1, 0x03, false},
+      {0x0C, specific, 1, 0x00, false},  // an uncorrectable memory error, whose bit does not last
+      {0x0C, severity, critical, 0x01, false},
+      {0x13, specific, 4, 0x00, false},  // a critical interrupt
+  };
+  for (TRow const& row : rows) {
+    std::string record = CompactSensorRecord(1, 0x60, row.fSensorType, "part");
+    record[typeOfRecord] = static_cast<char>(row.fEventType);
+    fController.fRecords = {record};
+    fController.fEvents = {SelEvent(0, row.fSensorType, 0x60, row.fEventType, row.fState)};
+    fController.fAnswers[Bytes({4, 0x2D, 0x60})] = Bytes({0, 0, 0xC0, row.fStates, 0x80});
+    fNs = NewNamespace();
+    EXPECT_THAT(Fill(), HasSubstr(row.fHasEnded ? "HasEnded: true" : "HasEnded: false"))
+        << row.fSensorType << " " << row.fEventType << " " << row.fStates;
+  }
+}
+
+TEST_F(ControllerNamespaceTest, AnEventWhoseStateCannotBeReadHasNotEnded) {
+  constexpr std::size_t readableStates = 18;
+  auto const readTo = [&](int flags, int readable) {
+    std::string record = CompactSensorRecord(1, 0x60, 8, "PSU 2");
+    record[readableStates] = static_cast<char>(readable);
+    fController.fRecords = {record};
+    fController.fEvents = {SelEvent(0, 8, 0x60, 0x6F, 1)};
+    fController.fAnswers[Bytes({4, 0x2D, 0x60})] = Bytes({0, 0, flags, 1, 0x80});
+    fNs = NewNamespace();
+    return Fill();
+  };
+  EXPECT_THAT(readTo(0xC0, 0x03), HasSubstr("HasEnded: true"));
+  EXPECT_THAT(readTo(0xE0, 0x03), HasSubstr("HasEnded: false")) << "the states are unavailable";
+  EXPECT_THAT(readTo(0xC0, 0x01), HasSubstr("HasEnded: false")) << "the sensor only reports the event";
+}
+
 TEST_F(ControllerNamespaceTest, SensorsOfTwoLunsStayApart) {
   constexpr std::size_t lunOfRecord = 6, lunOfEvent = 8;
   std::string other = CompactSensorRecord(3, 0x51, 8, "PSU 9"), end = SelEvent(1, 8, 0x51, 0x6F | 0x80, 1);

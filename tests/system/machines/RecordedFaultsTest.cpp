@@ -260,8 +260,7 @@ TEST_F(RecordedFaultsTest, OfTheSystem) {
 // readings and the empty event log are those of a healthy one.
 TEST_F(RecordedFaultsTest, OfTheManagementController) {
   fs::copy(TestDataPath("controller/zep-answers/ipmi"), Path(kIpmi));
-  std::string const info = ReadFile(Path(kIpmi + "0a40-"));
-  WriteFile(Path(kIpmi + "0a40-"), Patched(2, Bytes({0, 0}))(info));
+  WriteFile(Path(kIpmi + "0a40-"), Patched(2, Bytes({0, 0}))(ReadFile(Path(kIpmi + "0a40-"))));
   WriteFile(Path(kIpmi + "042d-01"), Bytes({0, 70, 0xC0, 0}));
   WriteFile(Path(kIpmi + "042d-02"), Bytes({0, 45, 0xC0, 0}));
   WriteFile(Path(kIpmi + "042d-03"), Bytes({0, 0, 0xC0, 1, 0}));
@@ -271,6 +270,7 @@ TEST_F(RecordedFaultsTest, OfTheManagementController) {
   WriteFile(Path(kIpmi + "0646-01"), Bytes({0}) + std::string(16, '\0'));
   WriteFile(Path(kIpmi + "0646-02"), Bytes({0}) + "support" + std::string(9, '\0'));
   std::string const removal = Bytes({0, 0xFF, 0xFF, 0, 0, 2, 0x23, 0x72, 3, 0x6B, 0x20, 0, 4, 8, 3, 0xEF, 0, 0xFF, 0xFF});
+  std::string const memory = Bytes({0, 0xFF, 0xFF, 0, 0, 2, 0x23, 0x72, 3, 0x6B, 0x20, 0, 4, 0x0C, 9, 0x6F, 1, 0xFF, 0xFF});
   TRow const rows[] = {
       {"error sensor-threshold", "air flow", {{kIpmi + "042d-01", Content(Bytes({0, 91, 0xC0, 0x18}))}}},
       {"error fan-stopped", "Replace the fan", {{kIpmi + "042d-02", Content(Bytes({0, 0, 0xC0, 0x07}))}}},
@@ -280,7 +280,9 @@ TEST_F(RecordedFaultsTest, OfTheManagementController) {
        {{kIpmi + "042d-03", Content(Bytes({0, 0, 0xC0, 0, 0}))},
         {kIpmi + "0a40-", Patched(2, Bytes({1, 0}))},
         {kIpmi + "0a43-0000000000ff", Content(removal)}}},
-      {"error event-log-critical", "ipmitool sel clear", {{kIpmi + "0a40-", Content(info)}}},
+      {"error event-log-critical",
+       "ipmitool sel clear",
+       {{kIpmi + "0a40-", Patched(2, Bytes({1, 0}))}, {kIpmi + "0a43-0000000000ff", Content(memory)}}},
       {"warning event-log-full", "ipmitool sel save", {{kIpmi + "0a40-", Patched(4, Bytes({0, 0}))}}},
       {"warning controller-clock", "ipmitool sel time set", {{kIpmi + "0a48-", Content(Bytes({0, 9, 0, 0, 0}))}}},
       {"information controller-account",
