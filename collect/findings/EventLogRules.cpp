@@ -18,7 +18,7 @@ struct TEvents {
 };
 
 // The text without the reading, which differs from entry to entry.
-std::string EventOf(std::string const& text) { return text.substr(0, text.find(';')); }
+std::string EventOf(std::string const& text) { return text.substr(0, text.find("; reading ")); }
 
 void AskEvents(TRuleRun& run) {
   constexpr std::uint64_t critical = 6;

@@ -69,14 +69,20 @@ std::string ReadingText(TSelEntry const& entry, TSdrSensor const& sensor) {
   return unit.empty() ? text : text + " " + unit;
 }
 
-// The second byte of an event of a defined type: "; Configuration Error"
+// The second and the third byte of an event of a defined type: "; Configuration Error", "; Memory module/device #4".
 std::string DetailText(TSelEntry const& entry, unsigned state) {
-  bool const hasDetail = entry.fEventType == kSensorSpecific && entry.fData[0] >> 6 == 3;
-  if (!hasDetail) return "";
-  std::string const text = TextOf([&](char* buffer, unsigned size) {
-    return ::ipmi_get_event_data2_message(entry.fSensorType, state, entry.fData[1], buffer, size);
-  });
-  return text.empty() ? "" : "; " + text;
+  constexpr unsigned isDefined = 3;
+  if (entry.fEventType != kSensorSpecific) return "";
+  std::string second, third;
+  if (entry.fData[0] >> 6 == isDefined)
+    second = TextOf([&](char* buffer, unsigned size) {
+      return ::ipmi_get_event_data2_message(entry.fSensorType, state, entry.fData[1], buffer, size);
+    });
+  if ((entry.fData[0] >> 4 & 3) == isDefined)
+    third = TextOf([&](char* buffer, unsigned size) {
+      return ::ipmi_get_event_data3_message(entry.fSensorType, state, entry.fData[1], entry.fData[2], buffer, size);
+    });
+  return (second.empty() ? "" : "; " + second) + (third.empty() ? "" : "; " + third);
 }
 
 }  // namespace

@@ -40,6 +40,13 @@ TEST(ControllerRulesTest, ACriticalEntryIsNamedWithItsAge) {
   EXPECT_THAT(Problems(rule, OnController(Entry(1, event, kCritical, 31 * kDay)), thresholds), testing::SizeIs(1));
 }
 
+TEST(ControllerRulesTest, EntriesAboutTwoModulesStayApart) {
+  std::string const event = "ECC: Uncorrectable ECC, asserted; Memory module/device #";
+  EXPECT_THAT(
+      Problems("event-log-critical", OnController(Entry(1, event + "1", kCritical, 10) + Entry(2, event + "2", kCritical, 10))),
+      ElementsAre(testing::HasSubstr(event + "1"), testing::HasSubstr(event + "2")));
+}
+
 std::string Log(std::string const& state) {
   return OnController("instance of ZEP_EventLog { InstanceID = \"l\"; " + state + " };");
 }

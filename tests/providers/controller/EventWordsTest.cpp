@@ -9,7 +9,7 @@ namespace NQRVZEP20 {
 namespace {
 
 constexpr int kThreshold = 1, kSpecific = 0x6F, kDeasserted = 0x80;
-constexpr int kTemperature = 1, kPowerSupply = 8, kMemory = 0x0C;
+constexpr int kTemperature = 1, kPowerSupply = 8, kMemory = 0x0C, kSlot = 0x21;
 
 TEST(EventWordsTest, EventsAreWritten) {
   struct TRow {
@@ -25,6 +25,11 @@ TEST(EventWordsTest, EventsAreWritten) {
       {SelEvent(1, kPowerSupply, 0x51, kSpecific, 0x01), "Power Supply Failure detected, asserted", EEventSeverity::kCritical},
       {SelEvent(1, kMemory, 0x60, kSpecific, 0x00), "Correctable ECC/other correctable memory error, asserted",
        EEventSeverity::kWarning},
+      {SelEvent(1, kMemory, 0x60, kSpecific, 0x38, 0xFF, 4), "Spare, asserted; Memory module/device #4",
+       EEventSeverity::kInformation},
+      {SelEvent(1, kMemory, 0x60, kSpecific, 0x08, 0xFF, 4), "Spare, asserted", EEventSeverity::kInformation},
+      {SelEvent(1, kSlot, 0x61, kSpecific, 0xF0, 0, 7),
+       "Fault Status asserted, asserted; Slot/Connector Type = PCI; Slot/Connector #7", EEventSeverity::kCritical},
       {SelEvent(1, kMemory, 0x60, kSpecific, 0x0F), "state 15, asserted", EEventSeverity::kUnknown},
   };
   auto const sensor = SdrRecordFrom(FullSensorRecord(1, 0x30, "CPU Temp")).fSensor;
