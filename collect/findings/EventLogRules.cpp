@@ -3,11 +3,44 @@
 #include "collect/findings/ControllerElements.h"
 #include "collect/findings/Rules.h"
 
+#include <algorithm>
+#include <iterator>
 #include <map>
 
 namespace NQRVZEP20 {
 
 namespace {
+
+// How critical entries are judged that are not about a broken part.
+struct TJudgement {
+  char const* fType;  // of the sensor
+  ESeverity fSeverity;
+  char const* fRemedy;
+};
+constexpr TJudgement kPartJudgement = {
+    "", ESeverity::kError,
+    "Check the part that this sensor watches, its power and its cooling, and replace it if the event happens again."};
+constexpr TJudgement kRemoval = {"", ESeverity::kWarning, "Insert the part again, unless it was removed on purpose."};
+constexpr char const* kReadSystemLog = "Search the log of the operating system for the cause.";
+constexpr TJudgement kOtherJudgements[] = {
+    {"Physical Security", ESeverity::kWarning, "Check that the machine is closed and connected, and who had access to it."},
+    {"Platform Security Violation Attempt", ESeverity::kWarning, "Find out who entered a wrong password."},
+    {"Session Audit", ESeverity::kWarning, "Find out who entered a wrong password at the controller."},
+    {"Event Logging Disabled", ESeverity::kInformation, "Switch the logging on again, unless it is off on purpose."},
+    {"Boot Error", ESeverity::kWarning, "Check the order of the boot devices, and whether the chosen one can be read."},
+    {"OS Boot", ESeverity::kWarning, kReadSystemLog},
+    {"OS Critical Stop", ESeverity::kWarning, kReadSystemLog},
+    {"Watchdog 1", ESeverity::kWarning, kReadSystemLog},
+    {"Watchdog 2", ESeverity::kWarning, kReadSystemLog},
+    {"Entity Presence", kRemoval.fSeverity, kRemoval.fRemedy}};
+
+TJudgement const& JudgementOf(TElement const& entry, std::string const& text) {
+  if (text.find(": Device Removed/Device Absent") != std::string::npos) return kRemoval;
+  auto const type = entry.Text("SensorTypeName");
+  auto const* const found = std::find_if(std::begin(kOtherJudgements), std::end(kOtherJudgements),
+                                         [&](TJudgement const& each) { return type.IsKnown() && *type.fValue == each.fType; });
+  return found == std::end(kOtherJudgements) ? kPartJudgement : *found;
+}
 
 // Critical entries with the same text.
 struct TEvents {
@@ -20,11 +53,9 @@ struct TEvents {
 // The text without the reading, which differs from entry to entry.
 std::string EventOf(std::string const& text) { return text.substr(0, text.find("; reading ")); }
 
-void AskEvents(TRuleRun& run) {
+std::map<std::string, TEvents> CriticalEvents(TRuleRun& run) {
   constexpr std::uint64_t critical = 6;
   std::map<std::string, TEvents> byText;
-  NoteUnread(run, "event log");
-  for (TElement const& log : run.TryElements("ZEP_EventLog")) run.Know(log, log.Number("CurrentNumberOfRecords"));
   for (TElement const& entry : OfController(run, "ZEP_EventLogEntry")) {
     auto const severity = entry.Number("PerceivedSeverity"), age = entry.Number("Age");
     auto const hasEnded = entry.Flag("HasEnded");
@@ -36,12 +67,18 @@ void AskEvents(TRuleRun& run) {
     ++events.fCount;
     if (*age.fValue <= events.fAge) events.fNewest = entry, events.fAge = *age.fValue;
   }
-  for (auto const& [text, events] : byText) {
+  return byText;
+}
+
+void AskEvents(TRuleRun& run) {
+  NoteUnread(run, "event log");
+  for (TElement const& log : run.TryElements("ZEP_EventLog")) run.Know(log, log.Number("CurrentNumberOfRecords"));
+  for (auto const& [text, events] : CriticalEvents(run)) {
+    TJudgement const& judgement = JudgementOf(events.fNewest, text);
     std::string const often = events.fCount > 1 ? ", the last of " + std::to_string(events.fCount) : "";
-    run.Add(events.fNewest, events.fSource, ESeverity::kError,
+    run.Add(events.fNewest, events.fSource, judgement.fSeverity,
             "the controller's event log has a critical entry: " + text + " (" + AgeText(events.fAge) + often + ")",
-            "Check the part that this sensor watches, its power and its cooling, and replace it if the event happens again. "
-            "After the repair, clear the event log (ipmitool sel clear).");
+            std::string(judgement.fRemedy) + " Then clear the event log (ipmitool sel clear).");
   }
 }
 

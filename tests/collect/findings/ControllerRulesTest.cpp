@@ -47,6 +47,31 @@ TEST(ControllerRulesTest, EntriesAboutTwoModulesStayApart) {
       ElementsAre(testing::HasSubstr(event + "1"), testing::HasSubstr(event + "2")));
 }
 
+TEST(ControllerRulesTest, AnEntryThatIsNotAboutAPartHasARemedyOfItsOwn) {
+  struct TRow {
+    char const *fType, *fText, *fSeverity, *fRemedy;
+  };
+  TRow const rows[] = {
+      {"Memory", "ECC: Uncorrectable ECC, asserted", "error", "replace it"},
+      {"Physical Security", "Cover: General Chassis Intrusion, asserted", "warning", "closed"},
+      {"Platform Security Violation Attempt", "Panel: Out-of-band Access Password Violation, asserted", "warning", "password"},
+      {"Event Logging Disabled", "SEL: All Event Logging Disabled, asserted", "information", "logging"},
+      {"Boot Error", "Boot: No bootable media, asserted", "warning", "boot devices"},
+      {"OS Critical Stop", "OS: Run-time Critical Stop, asserted", "warning", "operating system"},
+      {"Watchdog 2", "Watchdog: Hard Reset, asserted", "warning", "operating system"},
+      {"Fan", "Fan 3: Device Removed/Device Absent, asserted", "warning", "Insert"},
+  };
+  for (TRow const& row : rows) {
+    std::string entry = Entry(1, row.fText, kCritical, 10);
+    entry.insert(entry.find("RecordData"), std::string("SensorTypeName = \"") + row.fType + "\"; ");
+    auto const problems = FindingsOf(OnController(entry)).fProblems;
+    ASSERT_EQ(problems.size(), 1U) << row.fType;
+    EXPECT_EQ(NameOf(problems[0].fSeverity), row.fSeverity) << row.fType;
+    EXPECT_THAT(problems[0].fRemedy, testing::HasSubstr(row.fRemedy)) << row.fType;
+    EXPECT_THAT(problems[0].fRemedy, testing::HasSubstr("ipmitool sel clear")) << row.fType;
+  }
+}
+
 std::string Log(std::string const& state) {
   return OnController("instance of ZEP_EventLog { InstanceID = \"l\"; " + state + " };");
 }
