@@ -95,14 +95,32 @@ void AskLogFull(TRuleRun& run) {
   }
 }
 
+// Whether the newest entry with a date is later than the clock. Older ones may be from before the clock was corrected.
+bool IsNewestEntryLater(TRuleRun const& run) {
+  bool isLater = false;
+  for (TElement const& entry : run.TryElements("ZEP_EventLogEntry")) {
+    auto const age = entry.Number("Age");
+    bool const hasDate = age.IsKnown() || age.fMissing.fCode == kMissingUnexpected;
+    if (hasDate) isLater = !age.IsKnown();
+  }
+  return isLater;
+}
+
 void AskClock(TRuleRun& run) {
+  constexpr char const* firstYear = "2010";  // clocks that lost their time begin before it, such as in 2000
+  constexpr char const* remedy = "Set it (ipmitool sel time set now), so that events in its log have dates.";
+  NoteUnread(run, "event log");
   for (TElement const& log : OfController(run, "ZEP_EventLog")) {
-    auto const clock = log.Value("ClockTime");
-    if (clock.IsKnown() || clock.fMissing.fCode != kMissingPlaceholder)
-      run.Know(log, clock);
-    else
-      run.Add(log, clock.fSource, ESeverity::kWarning, "the clock of the management controller is not set",
-              "Set it (ipmitool sel time set now), so that events in its log have dates.");
+    auto const clock = log.Text("ClockTime");
+    auto const add = [&](std::string const& reason) { run.Add(log, clock.fSource, ESeverity::kWarning, reason, remedy); };
+    if (!clock.IsKnown() && clock.fMissing.fCode == kMissingPlaceholder)
+      add("the clock of the management controller is not set");
+    else if (!run.Know(log, clock))
+      continue;
+    else if (clock.fValue->substr(0, 4) < firstYear)
+      add("the clock of the management controller is in the year " + clock.fValue->substr(0, 4));
+    else if (IsNewestEntryLater(run))
+      add("the clock of the management controller is earlier than the newest entry of its event log");
   }
 }
 

@@ -117,6 +117,8 @@ bool IsOver(TSelEntry const& entry, TController const& controller) {
                      [&](TSensorState const& sensor) { return IsOf(entry, sensor.fSensor) && IsOutOfState(sensor, entry); });
 }
 
+constexpr std::uint64_t kLongestReading = 600;  // seconds; the clock is read before the entries, which may be added meanwhile
+
 TFinding<std::uint64_t> AgeOf(TSelEntry const& entry, TFinding<std::uint64_t> const& clock) {
   TSelTime const time = SelTimeFrom(entry.fTime);
   if (time.fKind == TSelTime::EKind::kUnknown) return TMissing{kMissingNotGiven, "the entry has no time"};
@@ -124,6 +126,7 @@ TFinding<std::uint64_t> AgeOf(TSelEntry const& entry, TFinding<std::uint64_t> co
     return TMissing{kMissingNotGiven, "the entry has no date: the clock of the controller was not set"};
   return clock.Then([&](std::uint64_t now) -> TFinding<std::uint64_t> {
     if (now >= time.fSeconds) return now - time.fSeconds;
+    if (time.fSeconds - now <= kLongestReading) return std::uint64_t{0};
     return TMissing{kMissingUnexpected, "the entry is later than the clock of the controller"};
   });
 }

@@ -102,6 +102,26 @@ TEST(ControllerRulesTest, AClockThatIsNotSetIsNamed) {
   EXPECT_THAT(Problems("controller-clock", Log("ClockTime = \"20210201000000.000000+000\";")), IsEmpty());
 }
 
+TEST(ControllerRulesTest, AClockThatLostItsTimeIsNamed) {
+  auto const at = [](char const* time) { return Log(std::string("ClockTime = \"") + time + ".000000+000\";"); };
+  EXPECT_THAT(Problems("controller-clock", at("20000101001530")),
+              ElementsAre("warning: the clock of the management controller is in the year 2000"));
+  EXPECT_THAT(Problems("controller-clock", at("20100101000000")), IsEmpty());
+
+  std::string const log = at("20210201000000"), problem = "earlier than the newest entry of its event log";
+  std::string const entries =
+      "instance of ZEP_EventLogEntry { RecordID = \"1\"; };"
+      "instance of ZEP_EventLogEntry { RecordID = \"2\"; Age = 10; };";
+  std::string const later = log + entries + "instance of ZEP_EventLogEntry { RecordID = \"3\"; };";
+  auto const ageIs = [](char const* code) { return Missing("ZEP_EventLogEntry.RecordID=\\\"3\\\"", "Age", code); };
+  EXPECT_THAT(Problems("controller-clock", later + ageIs("unexpected-form")), ElementsAre(testing::HasSubstr(problem)));
+  EXPECT_THAT(Problems("controller-clock", later + ageIs("not-given")), IsEmpty()) << "the entry has no date";
+  EXPECT_THAT(Problems("controller-clock",
+                       log + "instance of ZEP_EventLogEntry { RecordID = \"3\"; };" + entries + ageIs("unexpected-form")),
+              IsEmpty())
+      << "the clock was corrected after the first entry";
+}
+
 std::string Account(std::string const& name, int state, std::string const& privilege, bool hasAccess = true) {
   return OnController("instance of ZEP_ControllerAccount { Name = \"2\"; UserID = " + name +
                       "; EnabledState = " + std::to_string(state) + "; Privilege = \"" + privilege +

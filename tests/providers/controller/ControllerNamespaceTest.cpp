@@ -217,6 +217,15 @@ TEST_F(ControllerNamespaceTest, AThresholdEventOfASensorThatIsWithinItHasEnded) 
   EXPECT_THAT(Fill(), Not(HasSubstr("HasEnded: true")));
 }
 
+TEST_F(ControllerNamespaceTest, AnEntryThatIsAddedWhileTheLogIsReadIsNew) {
+  constexpr std::uint32_t clock = 1612137600;
+  fController.fEvents = {SelEvent(0, 8, 0x51, 0x6F, 1, 0xFF, 0xFF, clock + 600)};
+  EXPECT_THAT(Fill(), HasSubstr("  Age: 0\n"));
+  fController.fEvents = {SelEvent(0, 8, 0x51, 0x6F, 1, 0xFF, 0xFF, clock + 601)};
+  fNs = NewNamespace();
+  EXPECT_THAT(Fill(), HasSubstr("  Age: <the entry is later than the clock of the controller>\n"));
+}
+
 TEST_F(ControllerNamespaceTest, AFruDeviceThatIsNotReadHasTheReason) {
   std::string other = FruLocatorRecord(3, 5, "Node 2"), onBus = FruLocatorRecord(4, 6, "DIMM A1");
   other[5] = 0x22;  // the address of another controller
