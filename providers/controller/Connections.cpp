@@ -17,9 +17,14 @@ namespace {
 
 using TClock = std::chrono::steady_clock;
 
+// Without the reservation that a sensor data record is read with: a new one, after the loss of the first, is for the same record.
 std::string FileOf(TIpmiRequest const& request) {
+  constexpr std::uint8_t getSensorDataRecord = 0x23;
+  constexpr std::size_t reservation = 2;
   std::string const bytes = {static_cast<char>(request.fNetFn), static_cast<char>(request.fCommand)};
-  return "ipmi/" + HexText(bytes) + "-" + HexText(request.fData);
+  bool const isReserved =
+      request.fNetFn == kStorage && request.fCommand == getSensorDataRecord && request.fData.size() >= reservation;
+  return "ipmi/" + HexText(bytes) + "-" + HexText(request.fData.substr(isReserved ? reservation : 0));
 }
 
 TMissing TimeIsUp() { return {kMissingTimeIsUp, "the time limit for reading the controller had expired"}; }

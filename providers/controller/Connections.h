@@ -30,7 +30,7 @@ TIpmi WithinTime(TIpmi ipmi, std::chrono::steady_clock::duration limit);
 TIpmi InThreads(TIpmi ipmi, std::chrono::steady_clock::duration limit);
 
 // The recorded answers below the root of `files`, or those of `ipmi`, which are recorded if ZEP_RECORD_ANSWERS is set
-// (TMachineFiles::Answer). There is a file for each request: "ipmi/0a23-070001000005".
+// (TMachineFiles::Answer). There is a file for each request, without its reservation: "ipmi/0a23-01000005".
 TIpmi Recorded(TIpmi ipmi, TMachineFiles const& files);
 
 }  // namespace NQRVZEP20

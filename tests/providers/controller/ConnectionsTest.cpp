@@ -53,11 +53,28 @@ TEST(RecordedTest, AnswersAreRecordedAndReadAgain) {
   TTempDir const dir;
   TEnvironmentGuard const recording("ZEP_RECORD_ANSWERS", dir.Path().c_str());
   TIpmi const ipmi = [](TIpmiRequest const&) -> TFinding<std::string> { return Bytes({0, 7}); };
-  EXPECT_EQ(*Recorded(ipmi, TMachineFiles("/"))({0x0A, 0x23, Bytes({1, 0xFF})}), Bytes({0, 7}));
-  EXPECT_TRUE(std::filesystem::exists(dir.Path("zep-answers/ipmi/0a23-01ff")));
+  EXPECT_EQ(*Recorded(ipmi, TMachineFiles("/"))({0x0A, 0x43, Bytes({1, 0xFF})}), Bytes({0, 7}));
+  EXPECT_TRUE(std::filesystem::exists(dir.Path("zep-answers/ipmi/0a43-01ff")));
   TIpmi const replayed = Recorded(TIpmi(), TMachineFiles(dir.Path()));
-  EXPECT_EQ(*replayed({0x0A, 0x23, Bytes({1, 0xFF})}), Bytes({0, 7}));
+  EXPECT_EQ(*replayed({0x0A, 0x43, Bytes({1, 0xFF})}), Bytes({0, 7}));
   EXPECT_FALSE(replayed({0x0A, 0x24}));
+}
+
+// Another program cancels the reservation after the first answer.
+TEST(RecordedTest, ARecordingAfterALostReservationIsReadAgain) {
+  TTempDir const dir;
+  TEnvironmentGuard const recording("ZEP_RECORD_ANSWERS", dir.Path().c_str());
+  TIpmi const ipmi = [](TIpmiRequest const& request) -> TFinding<std::string> {
+    return request.fData[0] == 7 ? Bytes({kReservationLost}) : Bytes({0, 1, 0});
+  };
+  TIpmi const recorded = Recorded(ipmi, TMachineFiles("/"));
+  TIpmiRequest const first{0x0A, 0x23, Bytes({7, 0, 1, 0, 0, 5})}, second{0x0A, 0x23, Bytes({8, 0, 1, 0, 0, 5})};
+  recorded(first);
+  recorded(second);
+  EXPECT_TRUE(std::filesystem::exists(dir.Path("zep-answers/ipmi/0a23-01000005")));
+  TIpmi const replayed = Recorded(TIpmi(), TMachineFiles(dir.Path()));
+  EXPECT_EQ(*replayed(first), Bytes({0, 1, 0}));
+  EXPECT_EQ(*replayed(second), Bytes({0, 1, 0}));
 }
 
 TEST(SessionConnectionTest, AnAnswerOfNoBytesOrTooManyIsNone) {
