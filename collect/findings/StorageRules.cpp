@@ -87,25 +87,49 @@ std::string MembersText(std::uint64_t count, std::uint64_t all) {
   return std::to_string(count) + " of " + std::to_string(all) + (count == 1 ? " members is" : " members are");
 }
 
+// Whether the array is one that runs when it is complete. A container is always inactive. The kernel does not know the level of
+// an array before it runs, but it knows the version of metadata of its own form, such as 1.2.
+bool ShouldRun(TElement const& array) {
+  auto const level = array.Text("Level"), metadata = array.Text("MetadataVersion");
+  if (level.IsKnown()) return *level.fValue != "container";
+  return metadata.IsKnown() && metadata.fValue->find_first_of("0123456789") == 0;
+}
+
+// Returns whether the array runs, as far as it is known.
+bool AskWhetherItRuns(TRuleRun& run, TElement const& array, std::string const& name) {
+  auto const state = array.Text("State");
+  if (!run.Know(array, state)) return true;
+  bool const isStopped = *state.fValue == "inactive" || *state.fValue == "clear", isBroken = *state.fValue == "broken";
+  if (isBroken)
+    run.Add(
+        array, state.fSource, ESeverity::kCritical, name + " is broken: it has lost more members than it can do without",
+        "Connect the missing disks, then stop the array and assemble it again (mdadm --stop, mdadm --assemble); if a disk has "
+        "failed, restore the data.");
+  else if (isStopped && ShouldRun(array))
+    run.Add(array, state.fSource, ESeverity::kCritical, name + " does not run (" + *state.fValue + ")",
+            "Connect the missing disks (mdadm --examine shows the members), then start the array (mdadm --run).");
+  return !isBroken && !isStopped;
+}
+
+void AskWhetherItIsComplete(TRuleRun& run, TElement const& array, std::string const& name) {
+  auto const missing = array.Number("MissingMembers"), members = array.Number("Members"),
+             redundancy = array.Number("PackageRedundancy");
+  if (!run.Know(array, missing) || *missing.fValue == 0) return;
+  std::string const lacks = MembersText(*missing.fValue, members.IsKnown() ? *members.fValue : *missing.fValue) + " missing";
+  auto const action = array.Text("Action");
+  bool const isRebuilding = action.IsKnown() && (*action.fValue == "recover" || *action.fValue == "resync");
+  if (isRebuilding)
+    run.Add(array, missing.fSource, ESeverity::kWarning, name + " is being rebuilt: " + lacks,
+            "Wait until it is complete; until then a further failure may lose the data.");
+  else
+    run.Add(array, missing.fSource, redundancy.IsKnown() && *redundancy.fValue == 0 ? ESeverity::kCritical : ESeverity::kError,
+            name + " is degraded: " + lacks, "Replace the failed disk and add the new one (mdadm --add).");
+}
+
 void AskDegradedArray(TRuleRun& run) {
   for (TElement const& array : run.Elements("ZEP_RaidArray")) {
-    auto const missing = array.Number("MissingMembers"), members = array.Number("Members"),
-               redundancy = array.Number("PackageRedundancy");
-    if (!run.Know(array, missing) || *missing.fValue == 0) continue;
     std::string const name = "the RAID array " + array.NameIn("DeviceID");
-    std::string const state = array.Text("State").IsKnown() ? *array.Text("State").fValue : "";
-    std::string const lacks = MembersText(*missing.fValue, members.IsKnown() ? *members.fValue : *missing.fValue) + " missing";
-    auto const action = array.Text("Action");
-    bool const isRebuilding = action.IsKnown() && (*action.fValue == "recover" || *action.fValue == "resync");
-    if (state == "inactive" || state == "clear")
-      run.Add(array, missing.fSource, ESeverity::kCritical, name + " does not run: " + lacks,
-              "Connect the missing disks, then start the array (mdadm --run).");
-    else if (isRebuilding)
-      run.Add(array, missing.fSource, ESeverity::kWarning, name + " is being rebuilt: " + lacks,
-              "Wait until it is complete; until then a further failure may lose the data.");
-    else
-      run.Add(array, missing.fSource, redundancy.IsKnown() && *redundancy.fValue == 0 ? ESeverity::kCritical : ESeverity::kError,
-              name + " is degraded: " + lacks, "Replace the failed disk and add the new one (mdadm --add).");
+    if (AskWhetherItRuns(run, array, name)) AskWhetherItIsComplete(run, array, name);
   }
 }
 
@@ -116,7 +140,7 @@ std::vector<TRule> StorageRules() {
           {"disk-lost", "Has the kernel lost a disk?", AskLostDisk},
           {"disk-worn", "Is a solid-state disk worn?", AskWornDisk},
           {"disk-sectors", "Does a disk have bad sectors or uncorrected errors?", AskBadSectors},
-          {"array-degraded", "Does a RAID array lack a member?", AskDegradedArray}};
+          {"array-degraded", "Does a RAID array not run, or lack a member?", AskDegradedArray}};
 }
 
 }  // namespace NQRVZEP20

@@ -53,6 +53,20 @@ unsigned CopiesFrom(int layout) {
   return std::max(1U, bits & 255) * std::max(1U, bits >> 8 & 255);
 }
 
+// Whether an array of this level may lack members. A container only has the external metadata of other arrays.
+bool HasRedundancy(std::string const& level) {
+  constexpr char const* kWithout[] = {"raid0", "linear", "multipath", "faulty", "container"};
+  return std::find(std::begin(kWithout), std::end(kWithout), level) == std::end(kWithout);
+}
+
+// The kernel has the number only of an array that runs.
+TCode MissingMembersOf(TMachineFiles const& files, TRaidArray const& array) {
+  if (array.fLevel && !HasRedundancy(*array.fLevel))
+    return TMissing{kMissingNotApplicable,
+                    "an array of the level " + *array.fLevel + " has no redundancy: it cannot lack a member"};
+  return files.Number<unsigned short>(array.fDevice.File("md/degraded"));
+}
+
 // How many members of a complete array may fail.
 TCode CompleteRedundancy(TRaidArray const& array) {
   if (!array.fLevel) return array.fLevel.Why();
@@ -130,16 +144,18 @@ TRaidArray RaidArrayOf(TMachineFiles const& files, TBlockDevice const& device) {
   array.fState = files.Line(device.File("md/array_state"));
   array.fAction = files.Line(device.File("md/sync_action"));
   array.fDisks = files.Number<unsigned short>(device.File("md/raid_disks"));
-  array.fDegraded = files.Number<unsigned short>(device.File("md/degraded"));
+  array.fDegraded = MissingMembersOf(files, array);
   array.fLayout = files.Number<int>(device.File("md/layout"));
   array.fMembers = MembersOf(files, device);
   return array;
 }
 
 TCode RedundancyOf(TRaidArray const& array) {
-  unsigned short const lacking = array.fDegraded ? *array.fDegraded : static_cast<unsigned short>(0);
-  return CompleteRedundancy(array).Then(
-      [&](unsigned short redundancy) { return static_cast<unsigned short>(redundancy - std::min(redundancy, lacking)); });
+  return CompleteRedundancy(array).Then([&](unsigned short redundancy) -> TCode {
+    if (redundancy == 0) return redundancy;
+    return array.fDegraded.Then(
+        [&](unsigned short lacking) { return static_cast<unsigned short>(redundancy - std::min(redundancy, lacking)); });
+  });
 }
 
 TFinding<TVolumeStatus> StatusOf(TRaidArray const& array) {

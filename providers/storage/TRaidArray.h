@@ -29,14 +29,15 @@ struct TRaidArray {
   TFinding<std::string> fState = TMissing();        // "clean", "active", "inactive"
   TFinding<std::string> fAction = TMissing();       // "idle", "recover", "check"; missing for a level without redundancy
   TFinding<unsigned short> fDisks = TMissing();     // the number of members when it is complete
-  TFinding<unsigned short> fDegraded = TMissing();  // the number of members that it lacks
+  TFinding<unsigned short> fDegraded = TMissing();  // the number of members that it lacks, while it runs; see MissingMembers
   TFinding<int> fLayout = TMissing();
   std::vector<TRaidMember> fMembers;
 };
 
 TRaidArray RaidArrayOf(TMachineFiles const& files, TBlockDevice const& device);
 
-// How many members may fail at present without loss of data. Missing if level, disks or layout are.
+// How many members may fail at present without loss of data. Missing if level, disks or layout are, or if the number
+// of members that an array with redundancy lacks is, as while it does not run.
 TFinding<unsigned short> RedundancyOf(TRaidArray const& array);
 
 // The state of an array for OperationalStatus.

@@ -26,7 +26,7 @@ inline constexpr char const* kRuleClasses = R"(
   class CIM_DiskDrive : CIM_MediaAccessDevice { uint16 HealthState; };
   class ZEP_DiskHealth { [key] string InstanceID; string ElementName; uint8 PercentageUsed; uint8 AvailableSpare;
     uint8 AvailableSpareThreshold; uint64 PendingSectors; uint64 UncorrectableErrors; uint64 ReallocatedSectors; };
-  class ZEP_RaidArray { [key] string DeviceID; string State; uint16 Members; uint16 MissingMembers; string Action;
+  class ZEP_RaidArray { [key] string DeviceID; string Level; string MetadataVersion; string State; uint16 Members; uint16 MissingMembers; string Action;
     uint16 PackageRedundancy; };
   class CIM_LocalFileSystem { [key] string Name; string Root; string FileSystemType; boolean ReadOnly; uint64 FileSystemSize;
     uint64 AvailableSpace; };

@@ -54,21 +54,44 @@ TEST(RulesTest, BadSectorsAreCounted) {
               ElementsAre("error: the disk sda has unreadable sectors: 8", "warning: the disk sda has replaced bad sectors: 51"));
 }
 
-std::string Array(std::string const& state) {
-  return "instance of ZEP_RaidArray { DeviceID = \"md0\"; Members = 3; " + state + " };";
-}
+std::string Array(std::string const& state) { return "instance of ZEP_RaidArray { DeviceID = \"md0\"; " + state + " };"; }
 
 TEST(RulesTest, AnArrayIsJudgedByItsRedundancyAndState) {
   std::string const rule = "array-degraded";
   EXPECT_THAT(Problems(rule, Array("MissingMembers = 0; State = \"clean\";")), IsEmpty());
-  EXPECT_THAT(Problems(rule, Array("MissingMembers = 1; State = \"clean\"; PackageRedundancy = 0; Action = \"idle\";")),
-              ElementsAre("critical: the RAID array md0 is degraded: 1 of 3 members is missing"));
-  EXPECT_THAT(Problems(rule, Array("MissingMembers = 1; State = \"clean\"; PackageRedundancy = 1; Action = \"idle\";")),
-              ElementsAre("error: the RAID array md0 is degraded: 1 of 3 members is missing"));
-  EXPECT_THAT(Problems(rule, Array("MissingMembers = 1; State = \"clean\"; PackageRedundancy = 0; Action = \"recover\";")),
-              ElementsAre("warning: the RAID array md0 is being rebuilt: 1 of 3 members is missing"));
-  EXPECT_THAT(Problems(rule, Array("MissingMembers = 2; State = \"inactive\"; PackageRedundancy = 0;")),
-              ElementsAre("critical: the RAID array md0 does not run: 2 of 3 members are missing"));
+  EXPECT_THAT(
+      Problems(rule, Array("Members = 3; MissingMembers = 1; State = \"clean\"; PackageRedundancy = 0; Action = \"idle\";")),
+      ElementsAre("critical: the RAID array md0 is degraded: 1 of 3 members is missing"));
+  EXPECT_THAT(
+      Problems(rule, Array("Members = 3; MissingMembers = 1; State = \"clean\"; PackageRedundancy = 1; Action = \"idle\";")),
+      ElementsAre("error: the RAID array md0 is degraded: 1 of 3 members is missing"));
+  EXPECT_THAT(
+      Problems(rule, Array("Members = 3; MissingMembers = 1; State = \"clean\"; PackageRedundancy = 0; Action = \"recover\";")),
+      ElementsAre("warning: the RAID array md0 is being rebuilt: 1 of 3 members is missing"));
+}
+
+// The kernel has the number of missing members only of arrays that run and have redundancy.
+TEST(RulesTest, AnArrayThatDoesNotRunIsCritical) {
+  auto const problems = [](std::string const& state) { return Problems("array-degraded", Array(state)); };
+  std::string const inactive = "State = \"inactive\"; ";
+  auto const doesNotRun = ElementsAre("critical: the RAID array md0 does not run (inactive)");
+  EXPECT_THAT(problems(inactive + "Level = \"raid5\";"), doesNotRun);
+  EXPECT_THAT(problems(inactive + "MetadataVersion = \"1.2\";"), doesNotRun) << "the kernel has not read its level yet";
+  EXPECT_THAT(problems(inactive + "Level = \"raid1\"; MetadataVersion = \"external:/md127/0\";"), doesNotRun);
+  EXPECT_THAT(problems(inactive + "Level = \"container\"; MetadataVersion = \"external:ddf\";"), IsEmpty());
+  EXPECT_THAT(problems(inactive + "MetadataVersion = \"external:ddf\";"), IsEmpty());
+  EXPECT_THAT(problems("State = \"clear\"; MetadataVersion = \"none\"; Members = 0;"), IsEmpty()) << "a name without an array";
+  EXPECT_THAT(problems("Level = \"raid0\"; State = \"broken\";"),
+              ElementsAre("critical: the RAID array md0 is broken: it has lost more members than it can do without"));
+  EXPECT_THAT(problems("Level = \"raid1\"; State = \"broken\"; MissingMembers = 2;"), testing::SizeIs(1));
+}
+
+TEST(RulesTest, AnArrayWithoutRedundancyCannotLackAMember) {
+  std::string const array = Array("Level = \"raid0\"; State = \"clean\";") +
+                            Missing("ZEP_RaidArray.DeviceID=\\\"md0\\\"", "MissingMembers", "not-applicable");
+  auto const result = ResultOf("array-degraded", FindingsOf(array));
+  EXPECT_EQ(NameOf(result.fOutcome), "fine");
+  EXPECT_THAT(result.fNotAsked, IsEmpty());
 }
 
 // ---- File systems ----

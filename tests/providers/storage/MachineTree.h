@@ -27,6 +27,8 @@ public:
     WriteFile(fDir.Path() + path, text);
   }
 
+  void Remove(std::string const& path) { std::filesystem::remove(fDir.Path() + path); }
+
   void Link(std::string const& path, std::string const& target) {
     std::filesystem::create_directories(std::filesystem::path(fDir.Path() + path).parent_path());
     std::filesystem::create_symlink(target, fDir.Path() + path);

@@ -19,8 +19,11 @@ protected:
     Set("sync_completed", "none");
   }
 
-  void Set(std::string const& file, std::string const& text) {
-    fTree.Add("/sys/devices/virtual/block/md0/md/" + file, text + "\n");
+  void Set(std::string const& file, std::string const& text) { fTree.Add(kDirectory + file, text + "\n"); }
+
+  // The kernel has these files only while an array with redundancy runs.
+  void RemoveFilesOfRedundancy() {
+    for (char const* file : {"degraded", "sync_action", "sync_completed"}) fTree.Remove(kDirectory + file);
   }
 
   TRaidArray Array() const { return RaidArrayOf(fTree.fFiles, BlockDevicesOf(fTree.fFiles).at(0)); }
@@ -31,6 +34,7 @@ protected:
         property);
   }
 
+  std::string const kDirectory = "/sys/devices/virtual/block/md0/md/";
   TMachineTree fTree;
 };
 
@@ -39,10 +43,9 @@ TEST_F(TRaidArrayTest, Redundancy) {
     char const *fLevel, *fDisks, *fDegraded, *fLayout, *fRedundancy, *fCopies;
   };
   TRow const rows[] = {
-      {"raid0", "2", "0", "0", "0", "1"},      {"linear", "2", "0", "0", "0", "1"},   {"raid1", "3", "0", "0", "2", "3"},
-      {"raid1", "2", "1", "0", "0", "1"},      {"raid4", "3", "0", "0", "1", "1"},    {"raid5", "4", "1", "2", "0", "1"},
-      {"raid6", "5", "1", "2", "1", "1"},      {"raid6", "5", "3", "2", "0", "1"},    {"raid10", "4", "0", "258", "1", "2"},
-      {"raid10", "4", "1", "0x202", "2", "3"}, {"raid10", "4", "1", "258", "0", "1"},
+      {"raid1", "3", "0", "0", "2", "3"},    {"raid1", "2", "1", "0", "0", "1"},      {"raid4", "3", "0", "0", "1", "1"},
+      {"raid5", "4", "1", "2", "0", "1"},    {"raid6", "5", "1", "2", "1", "1"},      {"raid6", "5", "3", "2", "0", "1"},
+      {"raid10", "4", "0", "258", "1", "2"}, {"raid10", "4", "1", "0x202", "2", "3"}, {"raid10", "4", "1", "258", "0", "1"},
   };
   for (TRow const& row : rows) {
     Set("level", row.fLevel);
@@ -64,7 +67,6 @@ TEST_F(TRaidArrayTest, StatesAreStatuses) {
       {"active", "0", "check", "{ 2, 11 }", "{ active, check }", "{ 14 }"},
       {"active", "0", "resync", "{ 2, 11 }", "{ active, resync }", "{ 12 }"},
       {"active", "0", "reshape", "{ 2, 11 }", "{ active, reshape }", "{ 5 }"},
-      {"inactive", "0", "idle", "{ 10 }", "{ inactive }", "{ 2 }"},
       {"broken", "2", "frozen", "{ 6 }", "{ broken }", "{ 3, 9 }"},
   };
   for (TRow const& row : rows) {
@@ -75,6 +77,30 @@ TEST_F(TRaidArrayTest, StatesAreStatuses) {
     EXPECT_EQ(Value("StatusDescriptions"), row.fTexts) << row.fState;
     EXPECT_EQ(Value("ExtentStatus"), row.fExtentStatus) << row.fState;
   }
+}
+
+TEST_F(TRaidArrayTest, AnArrayThatDoesNotRunHasNoNumberOfMissingMembers) {
+  RemoveFilesOfRedundancy();
+  Set("array_state", "inactive");
+  EXPECT_EQ(Value("OperationalStatus"), "{ 10 }");
+  EXPECT_EQ(Value("StatusDescriptions"), "{ inactive }");
+  EXPECT_EQ(Value("ExtentStatus"), "{ 2 }");
+  for (char const* property : {"MissingMembers", "PackageRedundancy", "NoSinglePointOfFailure", "DataRedundancy"})
+    EXPECT_EQ(Value(property), "</sys/devices/virtual/block/md0/md/degraded does not exist>") << property;
+}
+
+TEST_F(TRaidArrayTest, AnArrayWithoutRedundancyCannotLackAMember) {
+  RemoveFilesOfRedundancy();
+  for (std::string const level : {"raid0", "linear"}) {
+    Set("level", level);
+    EXPECT_EQ(Value("MissingMembers"), "<an array of the level " + level + " has no redundancy: it cannot lack a member>");
+    EXPECT_EQ(Value("PackageRedundancy"), "0");
+    EXPECT_EQ(Value("DataRedundancy"), "1");
+    EXPECT_EQ(Value("OperationalStatus"), "{ 2 }");
+  }
+  Set("array_state", "broken");
+  EXPECT_EQ(Value("OperationalStatus"), "{ 6 }");
+  EXPECT_EQ(Value("ExtentStatus"), "{ 3 }");
 }
 
 TEST_F(TRaidArrayTest, Progress) {

@@ -22,8 +22,9 @@ using testing::HasSubstr;
 using testing::IsEmpty;
 using testing::Not;
 
-// Returns the content of a file with the fault.
+// Returns the content of a file with the fault; an empty function removes the file.
 using TFault = std::function<std::string(std::string const& content)>;
+TFault const kRemoved;
 
 TFault Content(std::string const& content) {
   return [content](std::string const&) { return content; };
@@ -45,12 +46,14 @@ struct TRow {
   char const* fProblem;  // severity and rule
   char const* fRemedy;   // a part of it
   std::vector<std::pair<std::string, TFault>> fChanges;
+  char const* fReason = "";  // a part of it
 };
 
 std::string const kPort = "sys/devices/pci0000:00/0000:00:03.0/", kCard = kPort + "0000:01:00.0/";
 std::string const kDisk = kCard + "0000:02:00.0/0000:03:00.0/", kSensor = kDisk + "nvme/nvme0/hwmon0/";
 std::string const kEthernet = kCard + "0000:02:01.0/0000:04:00.0/net/eth1/";
 std::string const kSupply = "sys/class/power_supply/", kModules = "sys/devices/system/edac/mc/mc0/";
+std::string const kArray = "sys/devices/virtual/block/md0/md/";
 std::string const kAnswers = "zep-answers/", kIpmi = kAnswers + "ipmi/";
 constexpr std::size_t kClockStatus = 40;  // in the structure of adjtimex
 
@@ -120,7 +123,10 @@ protected:
     for (auto const& [path, fault] : row.fChanges) {
       ASSERT_TRUE(fs::exists(Path(path))) << path;
       healthy[path] = ReadFile(Path(path));
-      WriteFile(Path(path), fault(healthy[path]));
+      if (fault)
+        WriteFile(Path(path), fault(healthy[path]));
+      else
+        fs::remove(Path(path));
     }
     ExpectProblems(row, Findings()["problems"]);
     for (auto const& [path, content] : healthy) WriteFile(Path(path), content);
@@ -131,6 +137,7 @@ protected:
     for (nlohmann::json const& problem : problems) {
       EXPECT_EQ(problem["severity"].get<std::string>() + " " + problem["rule"].get<std::string>(), row.fProblem);
       EXPECT_THAT(problem["remedy"].get<std::string>(), HasSubstr(row.fRemedy));
+      EXPECT_THAT(problem["reason"].get<std::string>(), HasSubstr(row.fReason));
     }
   }
 
@@ -158,9 +165,30 @@ TEST_F(RecordedFaultsTest, OfDisksAndFileSystems) {
       {"warning disk-sectors", "if it grows", {{kAnswers + "smartctl/sda", reallocated}}},
       {"critical array-degraded",
        "mdadm --add",
-       {{"sys/block/md0/md/degraded", Content("1\n")},
-        {"sys/block/md0/md/dev-vda1/state", Content("faulty\n")},
-        {"sys/block/md0/md/dev-vda1/slot", Content("none\n")}}},
+       {{kArray + "degraded", Content("1\n")},
+        {kArray + "dev-vda1/state", Content("faulty\n")},
+        {kArray + "dev-vda1/slot", Content("none\n")}},
+       "the RAID array md0 is degraded: 1 of 2 members is missing"},
+      {"error array-degraded",
+       "mdadm --add",
+       {{kArray + "raid_disks", Content("3\n")}, {kArray + "degraded", Content("1\n")}},
+       "the RAID array md0 is degraded: 1 of 3 members is missing"},
+      {"warning array-degraded",
+       "Wait until it is complete",
+       {{kArray + "degraded", Content("1\n")}, {kArray + "sync_action", Content("recover\n")}},
+       "the RAID array md0 is being rebuilt: 1 of 2 members is missing"},
+      {"critical array-degraded",
+       "mdadm --run",
+       {{kArray + "array_state", Content("inactive\n")},
+        {kArray + "level", Content("\n")},
+        {kArray + "raid_disks", Content("0\n")},
+        {kArray + "degraded", kRemoved},
+        {kArray + "sync_action", kRemoved}},
+       "the RAID array md0 does not run (inactive)"},
+      {"critical array-degraded",
+       "mdadm --assemble",
+       {{kArray + "array_state", Content("broken\n")}, {kArray + "level", Content("raid0\n")}, {kArray + "degraded", kRemoved}},
+       "the RAID array md0 is broken"},
       {"error file-system-full",
        "enlarge",
        {{kAnswers + "statvfs/data/values", Content("1024 1024 89361 60 50 25376 25364 255\n")}}},
