@@ -10,10 +10,15 @@ namespace {
 constexpr char const* kReplaceDisk = "Save the data of this disk and replace it.";
 
 void AskFailingDisk(TRuleRun& run) {
-  constexpr std::uint64_t healthy = 5;
+  constexpr std::uint64_t healthy = 5, degraded = 10;  // degraded: by its temperature alone
   for (TElement const& disk : run.Elements("CIM_DiskDrive")) {
     auto const state = disk.Number("HealthState");
-    if (run.Know(disk, state) && *state.fValue != healthy)
+    if (!run.Know(disk, state) || *state.fValue == healthy) continue;
+    if (*state.fValue == degraded)
+      run.Add(disk, state.fSource, ESeverity::kWarning,
+              "the disk " + disk.NameIn("DeviceID") + " reports a temperature out of its range (SMART)",
+              "Check the fans, the air flow and the temperature of the room.");
+    else
       run.Add(disk, state.fSource, ESeverity::kCritical,
               "the disk " + disk.NameIn("DeviceID") + " reports that it is failing (SMART)", kReplaceDisk);
   }
@@ -136,7 +141,7 @@ void AskDegradedArray(TRuleRun& run) {
 }  // namespace
 
 std::vector<TRule> StorageRules() {
-  return {{"disk-failing", "Does a disk report that it is failing?", AskFailingDisk},
+  return {{"disk-failing", "Does a disk report that it is failing, or too hot?", AskFailingDisk},
           {"disk-lost", "Has the kernel lost a disk?", AskLostDisk},
           {"disk-worn", "Is a solid-state disk worn?", AskWornDisk},
           {"disk-sectors", "Does a disk have bad sectors or uncorrected errors?", AskBadSectors},

@@ -22,7 +22,7 @@ constexpr char const* kSource = "sysfs, udev";
 
 // Values of the schema (ValueNames.h).
 constexpr unsigned short kSequentialAccess = 2, kRandomAccess = 3, kWriting = 4, kRemovableMedia = 7;
-constexpr unsigned short kPredictiveFailure = 5, kHealthy = 5, kMajorFailure = 20;
+constexpr unsigned short kPredictiveFailure = 5, kHealthy = 5, kDegraded = 10, kMajorFailure = 20;
 constexpr unsigned short kHardDisk = 2, kSolidState = 3;
 constexpr unsigned short kOtherFormFactor = 1, kFormFactor525 = 3;
 constexpr unsigned short kOther = 1, kATA = 3, kSATA = 4, kSAS = 5, kFC = 6;
@@ -53,17 +53,18 @@ TFinding<TStatus> StatusFrom(std::string const& state) {
 }
 
 // The state that the kernel reports, and that of a disk that is failing by its own judgement.
-TFinding<TStatus> StatusOf(TDisk const& disk, TFinding<bool> const& passed) {
+TFinding<TStatus> StatusOf(TDisk const& disk, TSmartReport const& health) {
   TFinding<TStatus> const ofKernel = disk.fState.Then(StatusFrom);
-  if (!passed || *passed) return ofKernel;
+  if (!health.fPassed || *health.fPassed || IsOnlyTemperature(health)) return ofKernel;
   TStatus status = ofKernel ? *ofKernel : TStatus();
   status.fCodes.push_back(kPredictiveFailure);
   status.fTexts.emplace_back("the disk reports that it is failing");
   return status;
 }
 
-TCode HealthStateOf(TFinding<bool> const& passed) {
-  return passed.Then([](bool isHealthy) { return isHealthy ? kHealthy : kMajorFailure; });
+TCode HealthStateOf(TSmartReport const& health) {
+  if (IsOnlyTemperature(health)) return kDegraded;
+  return health.fPassed.Then([](bool isHealthy) { return isHealthy ? kHealthy : kMajorFailure; });
 }
 
 TIdentifiers IdentifiersOf(TMachineFiles const& files, TDisk const& disk) {
@@ -171,8 +172,8 @@ TRecord DiskDriveRecord(TMachineFiles const& files, TDisk const& disk, TSmartRep
                         TComputerSystem const& system) {
   TText const& transport = disk.fAttachment.fTransport;
   TFinding<unsigned> const& rotations = disk.fRotationsPerMinute ? disk.fRotationsPerMinute : health.fRotationsPerMinute;
-  TRecord record = AnyDriveRecord("CIM_DiskDrive", files, disk, StatusOf(disk, health.fPassed), system);
-  record.Add("HealthState", HealthStateOf(health.fPassed)).Names(kHealthStateNames);
+  TRecord record = AnyDriveRecord("CIM_DiskDrive", files, disk, StatusOf(disk, health), system);
+  record.Add("HealthState", HealthStateOf(health)).Names(kHealthStateNames);
   record.Add("DiskType", DiskTypeOf(files, disk, rotations)).Names(kDiskTypeNames);
   record.Add("RPM", RotationsOf(rotations)).Unit("revolution / minute");
   record.Add("FormFactor", (disk.fFormFactor ? disk.fFormFactor : health.fFormFactor).Then(FormFactorFrom))

@@ -174,6 +174,11 @@ bool HasHealth(TSmartReport const& report) {
          report.fUncorrectable || report.fPercentageUsed || !report.fAttributes.empty();
 }
 
+bool IsOnlyTemperature(TSmartReport const& report) {
+  constexpr unsigned char temperature = 1U << 1;
+  return report.fPassed && !*report.fPassed && report.fCriticalWarning && *report.fCriticalWarning == temperature;
+}
+
 TSmartReport SmartReportFrom(std::string const& text) {
   TJson const json = TJson::parse(text, nullptr, false);
   if (!json.is_object()) return NoSmartReport({kMissingUnexpected, "the output of smartctl is not an object in JSON"});

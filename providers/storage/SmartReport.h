@@ -36,6 +36,9 @@ struct TSmartReport {
 // Whether the report has any value about the health of the disk.
 bool HasHealth(TSmartReport const& report);
 
+// Whether the temperature is all that the disk complains about: an NVMe disk whose critical warning has bit 1 alone.
+bool IsOnlyTemperature(TSmartReport const& report);
+
 // A report whose values are all missing for that reason.
 TSmartReport NoSmartReport(TMissing const& why);
 

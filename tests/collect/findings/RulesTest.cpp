@@ -15,9 +15,16 @@ using testing::IsEmpty;
 // ---- Disks ----
 
 TEST(RulesTest, AFailingDiskIsCritical) {
-  EXPECT_THAT(Problems("disk-failing", R"(instance of CIM_DiskDrive { DeviceID = "sda"; HealthState = 25; };
+  EXPECT_THAT(Problems("disk-failing", R"(instance of CIM_DiskDrive { DeviceID = "sda"; HealthState = 20; };
                                           instance of CIM_DiskDrive { DeviceID = "sdb"; HealthState = 5; };)"),
               ElementsAre("critical: the disk sda reports that it is failing (SMART)"));
+}
+
+TEST(RulesTest, AHotDiskIsAWarning) {
+  std::string const disk = R"(instance of CIM_DiskDrive { DeviceID = "nvme0n1"; HealthState = 10; };)";
+  EXPECT_THAT(Problems("disk-failing", disk),
+              ElementsAre("warning: the disk nvme0n1 reports a temperature out of its range (SMART)"));
+  EXPECT_THAT(FindingsOf(disk).fProblems.at(0).fRemedy, testing::HasSubstr("air flow"));
 }
 
 TEST(RulesTest, ADiskOfUnknownHealthCannotBeJudged) {
@@ -540,7 +547,7 @@ TEST(RulesTest, WithoutProvidersNoRuleCanBeAskedButThatOfPlugIns) {
 
 TEST(RulesTest, TheWorstProblemComesFirst) {
   auto const findings = FindingsOf(State("Taint = 16; FailedUnits = {\"a\"};") +
-                                   "instance of CIM_DiskDrive { DeviceID = \"sda\"; HealthState = 25; };");
+                                   "instance of CIM_DiskDrive { DeviceID = \"sda\"; HealthState = 20; };");
   std::vector<std::string> rules;
   for (TProblem const& problem : findings.fProblems) rules.push_back(problem.fRule);
   EXPECT_THAT(rules, ElementsAre("disk-failing", "kernel-taint", "failed-units"));
@@ -548,7 +555,7 @@ TEST(RulesTest, TheWorstProblemComesFirst) {
 }
 
 TEST(RulesTest, AProblemNamesItsInstanceAndSource) {
-  auto const findings = FindingsOf("instance of CIM_DiskDrive { DeviceID = \"sda\"; HealthState = 25; };");
+  auto const findings = FindingsOf("instance of CIM_DiskDrive { DeviceID = \"sda\"; HealthState = 20; };");
   ASSERT_EQ(findings.fProblems.size(), 1u);
   EXPECT_EQ(findings.fProblems[0].fInstance, "root/test:CIM_DiskDrive.DeviceID=\"sda\"");
   EXPECT_EQ(findings.fProblems[0].fSource, "provider Test");

@@ -51,6 +51,18 @@ TEST_F(DriveRecordsTest, AFailingDiskIsMarked) {
   EXPECT_EQ(Value("StatusDescriptions"), "{ running, the disk reports that it is failing }");
 }
 
+TEST_F(DriveRecordsTest, AHotDiskIsNotFailing) {
+  constexpr unsigned char spare = 1, temperature = 2;
+  fHealth.fPassed = false;
+  fHealth.fCriticalWarning = temperature;
+  EXPECT_EQ(Value("HealthState"), "10");
+  EXPECT_EQ(Value("OperationalStatus"), "{ 2 }");
+  EXPECT_EQ(Value("StatusDescriptions"), "{ running }");
+  fHealth.fCriticalWarning = static_cast<unsigned char>(spare | temperature);
+  EXPECT_EQ(Value("HealthState"), "20");
+  EXPECT_EQ(Value("OperationalStatus"), "{ 2, 5 }");
+}
+
 TEST_F(DriveRecordsTest, RotationAndFormFactorMayComeFromSmartctl) {
   EXPECT_EQ(Value("DiskType"), "2");
   EXPECT_EQ(Value("RPM"), "<no smartctl>");

@@ -122,9 +122,10 @@ protected:
     std::map<std::string, std::string> healthy;
     for (auto const& [path, fault] : row.fChanges) {
       ASSERT_TRUE(fs::exists(Path(path))) << path;
-      healthy[path] = ReadFile(Path(path));
+      std::string const content = ReadFile(Path(path));
+      healthy.try_emplace(path, content);
       if (fault)
-        WriteFile(Path(path), fault(healthy[path]));
+        WriteFile(Path(path), fault(content));
       else
         fs::remove(Path(path));
     }
@@ -155,6 +156,11 @@ TEST_F(RecordedFaultsTest, OfDisksAndFileSystems) {
       {"critical disk-failing",
        "replace it",
        {{kAnswers + "smartctl/sda", Replaced(R"("smart_status":{"passed":true)", R"("smart_status":{"passed":false)")}}},
+      {"warning disk-failing",
+       "air flow",
+       {{kAnswers + "smartctl/nvme0n1", Replaced(R"("passed":true,"nvme":{"value":0})", R"("passed":false,"nvme":{"value":2})")},
+        {kAnswers + "smartctl/nvme0n1", Replaced(R"("critical_warning":0)", R"("critical_warning":2)")}},
+       "the disk nvme0n1 reports a temperature out of its range"},
       {"error disk-lost", "cable", {{"sys/class/block/sda/device/state", Content("offline\n")}}},
       {"warning disk-worn",
        "Plan its replacement",
