@@ -34,6 +34,11 @@ bool IsReadOnly(TElement const& system) {
   return isReadOnly.IsKnown() && *isReadOnly.fValue;
 }
 
+std::string FullText(std::uint64_t free, std::uint64_t percent) {
+  if (free == 0) return " is full";
+  return percent == 0 ? " has less than 1 % free" : " is nearly full: " + std::to_string(percent) + " % free";
+}
+
 void AskFullFileSystem(TRuleRun& run) {
   constexpr std::uint64_t gibibyte = 1ull << 30, almostNone = 1;
   for (TElement const& system : run.Elements("CIM_LocalFileSystem")) {
@@ -46,8 +51,7 @@ void AskFullFileSystem(TRuleRun& run) {
         *free.fValue >= run.Thresholds().fFileSystemFreeGibibytes * gibibyte)
       continue;
     run.Add(system, free.fSource, percent < almostNone ? ESeverity::kError : ESeverity::kWarning,
-            name + (percent < almostNone ? " is full" : " is nearly full: " + std::to_string(percent) + " % free"),
-            "Delete what is not needed, or enlarge the file system.");
+            name + FullText(*free.fValue, percent), "Delete what is not needed, or enlarge the file system.");
   }
 }
 
@@ -66,6 +70,11 @@ void AskInodes(TRuleRun& run) {
   }
 }
 
+// An overlay without an upper directory, such as the mounted image of a container, cannot be written to.
+bool IsReadOnlyOverlay(std::string const& type, std::string const& options) {
+  return type == "overlay" && ("," + options).find(",upperdir=") == std::string::npos;
+}
+
 bool HasOption(std::string const& options, std::string const& option) {
   return ("," + options + ",").find("," + option + ",") != std::string::npos;
 }
@@ -74,8 +83,10 @@ bool HasOption(std::string const& options, std::string const& option) {
 // became read-only, only the file system has it.
 void AskReadOnlyFileSystem(TRuleRun& run) {
   for (TElement const& mount : run.Elements("ZEP_Mount")) {
-    auto const options = mount.Text("Options"), ofSystem = mount.Text("FileSystemOptions"), type = mount.Text("Type");
-    if (!run.Know(mount, options) || !run.Know(mount, ofSystem) || (type.IsKnown() && IsImage(*type.fValue))) continue;
+    auto const options = mount.Text("Options"), ofSystem = mount.Text("FileSystemOptions");
+    if (!run.Know(mount, options) || !run.Know(mount, ofSystem)) continue;
+    std::string const type = mount.Text("Type").fValue.value_or("");
+    if (IsImage(type) || IsReadOnlyOverlay(type, *ofSystem.fValue)) continue;
     if (HasOption(*options.fValue, "rw") && HasOption(*ofSystem.fValue, "ro"))
       run.Add(mount, ofSystem.fSource, ESeverity::kError, "the file system on " + mount.Label() + " has become read-only",
               "Look in the kernel's log for the error, check the disk, then check the file system (fsck) and mount it again.");

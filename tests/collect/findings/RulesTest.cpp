@@ -115,6 +115,8 @@ TEST(RulesTest, AFileSystemIsNearlyFullByPercentAndBySize) {
   EXPECT_THAT(Problems(rule, FileSystem("ext4", "100000000000", "10000000000")), IsEmpty());
   EXPECT_THAT(Problems(rule, FileSystem("xfs", "10000000000000", "500000000000")), IsEmpty()) << "500 GB are enough";
   EXPECT_THAT(Problems(rule, FileSystem("ext4", "100000000000", "0")), ElementsAre("error: the file system on /data is full"));
+  EXPECT_THAT(Problems(rule, FileSystem("ext4", "3000000000000", "20000000000")),
+              ElementsAre("error: the file system on /data has less than 1 % free"));
   EXPECT_THAT(Problems(rule, FileSystem("squashfs", "100000000", "0")), IsEmpty()) << "an image is always full";
   EXPECT_THAT(Problems(rule, FileSystem("ext4", "100000000000", "0", "ReadOnly = true;")), IsEmpty());
   TThresholds thresholds;
@@ -148,6 +150,8 @@ TEST(RulesTest, AFileSystemThatBecameReadOnlyIsAnError) {
   EXPECT_THAT(Problems(rule, Mount("ext4", "ro,noatime", "ro")), IsEmpty()) << "mounted so on purpose";
   EXPECT_THAT(Problems(rule, Mount("ext4", "rw", "rw,errors=remount-ro")), IsEmpty());
   EXPECT_THAT(Problems(rule, Mount("squashfs", "rw", "ro")), IsEmpty());
+  EXPECT_THAT(Problems(rule, Mount("overlay", "rw,relatime", "ro,lowerdir=/l/A:/l/B")), IsEmpty()) << "a mounted image";
+  EXPECT_THAT(Problems(rule, Mount("overlay", "rw,relatime", "ro,lowerdir=/l/A,upperdir=/u,workdir=/w")), testing::SizeIs(1));
 }
 
 // ---- Network ----
