@@ -44,6 +44,8 @@ void AskLostDisk(TRuleRun& run) {
   }
 }
 
+std::string DiskOf(TElement const& health) { return "the disk " + health.NameIn("Disk"); }
+
 void AskWornDisk(TRuleRun& run) {
   for (TElement const& health : run.Elements("ZEP_DiskHealth")) {
     auto const used = health.Number("PercentageUsed"), spare = health.Number("AvailableSpare"),
@@ -52,12 +54,10 @@ void AskWornDisk(TRuleRun& run) {
     run.Know(health, used.IsKnown() ? used : spare);
     if (spare.IsKnown() && spareLimit.IsKnown() && *spare.fValue < *spareLimit.fValue)
       run.Add(health, spare.fSource, ESeverity::kError,
-              "the disk " + health.Label() + " has only " + std::to_string(*spare.fValue) + " % of its spare blocks left",
-              kReplaceDisk);
+              DiskOf(health) + " has only " + std::to_string(*spare.fValue) + " % of its spare blocks left", kReplaceDisk);
     if (used.IsKnown() && *used.fValue >= run.Thresholds().fDiskUsedPercent)
       run.Add(health, used.fSource, ESeverity::kWarning,
-              "the disk " + health.Label() + " has used " + std::to_string(*used.fValue) + " % of its expected life",
-              "Plan its replacement.");
+              DiskOf(health) + " has used " + std::to_string(*used.fValue) + " % of its expected life", "Plan its replacement.");
   }
 }
 
@@ -74,8 +74,7 @@ void AskBadSectors(TRuleRun& run) {
       if (!count.IsKnown()) continue;  // which counters there are depends on the disk
       run.Know(health, count);
       if (*count.fValue > 0)
-        run.Add(health, count.fSource, ESeverity::kError,
-                "the disk " + health.Label() + " has " + words + ": " + std::to_string(*count.fValue),
+        run.Add(health, count.fSource, ESeverity::kError, DiskOf(health) + " has " + words + ": " + std::to_string(*count.fValue),
                 "Save the data of this disk, test it (smartctl -t long), and replace it if the number grows.");
     }
     auto const reallocated = health.Number("ReallocatedSectors");
@@ -83,7 +82,7 @@ void AskBadSectors(TRuleRun& run) {
     run.Know(health, reallocated);
     if (*reallocated.fValue > run.Thresholds().fReallocatedSectors)
       run.Add(health, reallocated.fSource, ESeverity::kWarning,
-              "the disk " + health.Label() + " has replaced bad sectors: " + std::to_string(*reallocated.fValue),
+              DiskOf(health) + " has replaced bad sectors: " + std::to_string(*reallocated.fValue),
               "Watch the number, and replace the disk if it grows.");
   }
 }

@@ -70,6 +70,7 @@ TRecord HealthRecord(std::string const& disk, TSmartReport const& report) {
   TRecord record("ZEP_DiskHealth", "smartctl", "CIM_StatisticalData");
   record.AddKey("InstanceID", "ZEP:health:" + disk);
   record.AddOwn("ElementName", "Health of " + disk);
+  record.Add("Disk", TText(disk));
   record.Add("Passed", report.fPassed);
   record.Add("Temperature", report.fTemperature).Unit("degree celsius");
   record.Add("PowerOnHours", report.fPowerOnHours).Unit("hour");

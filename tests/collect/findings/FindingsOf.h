@@ -24,7 +24,7 @@ inline constexpr char const* kRuleClasses = R"(
   Qualifier Association : boolean = false, Scope(association), Flavor(DisableOverride);
   class CIM_MediaAccessDevice { [key] string DeviceID; uint16 OperationalStatus[]; string StatusDescriptions[]; };
   class CIM_DiskDrive : CIM_MediaAccessDevice { uint16 HealthState; };
-  class ZEP_DiskHealth { [key] string InstanceID; string ElementName; uint8 PercentageUsed; uint8 AvailableSpare;
+  class ZEP_DiskHealth { [key] string InstanceID; string ElementName; string Disk; uint8 PercentageUsed; uint8 AvailableSpare;
     uint8 AvailableSpareThreshold; uint64 PendingSectors; uint64 UncorrectableErrors; uint64 ReallocatedSectors; };
   class ZEP_RaidArray { [key] string DeviceID; string Level; string MetadataVersion; string State; uint16 Members; uint16 MissingMembers; string Action;
     uint16 PackageRedundancy; };

@@ -44,20 +44,20 @@ TEST(RulesTest, ADiskThatTheKernelCannotUseIsAnError) {
 
 TEST(RulesTest, AWornDiskIsNamedWithItsWear) {
   EXPECT_THAT(Problems("disk-worn", R"(
-      instance of ZEP_DiskHealth { InstanceID = "1"; ElementName = "nvme0n1"; PercentageUsed = 104; AvailableSpare = 4;
+      instance of ZEP_DiskHealth { InstanceID = "1"; ElementName = "Health of nvme0n1"; Disk = "nvme0n1"; PercentageUsed = 104; AvailableSpare = 4;
                                    AvailableSpareThreshold = 10; };
-      instance of ZEP_DiskHealth { InstanceID = "2"; ElementName = "nvme1n1"; PercentageUsed = 89; AvailableSpare = 100;
+      instance of ZEP_DiskHealth { InstanceID = "2"; ElementName = "Health of nvme1n1"; Disk = "nvme1n1"; PercentageUsed = 89; AvailableSpare = 100;
                                    AvailableSpareThreshold = 10; };
-      instance of ZEP_DiskHealth { InstanceID = "3"; ElementName = "sda"; };)"),
+      instance of ZEP_DiskHealth { InstanceID = "3"; ElementName = "Health of sda"; Disk = "sda"; };)"),
               ElementsAre("error: the disk nvme0n1 has only 4 % of its spare blocks left",
                           "warning: the disk nvme0n1 has used 104 % of its expected life"));
 }
 
 TEST(RulesTest, BadSectorsAreCounted) {
   EXPECT_THAT(Problems("disk-sectors", R"(
-      instance of ZEP_DiskHealth { InstanceID = "1"; ElementName = "sda"; PendingSectors = 8; UncorrectableErrors = 0;
+      instance of ZEP_DiskHealth { InstanceID = "1"; ElementName = "Health of sda"; Disk = "sda"; PendingSectors = 8; UncorrectableErrors = 0;
                                    ReallocatedSectors = 51; };
-      instance of ZEP_DiskHealth { InstanceID = "2"; ElementName = "sdb"; PendingSectors = 0; ReallocatedSectors = 50; };)"),
+      instance of ZEP_DiskHealth { InstanceID = "2"; ElementName = "Health of sdb"; Disk = "sdb"; PendingSectors = 0; ReallocatedSectors = 50; };)"),
               ElementsAre("error: the disk sda has unreadable sectors: 8", "warning: the disk sda has replaced bad sectors: 51"));
 }
 

@@ -47,6 +47,12 @@ TEST_F(HealthTest, AMissingAnswerIsAReason) {
   EXPECT_EQ(TextOf(Health().at("nvme0n1").fPassed), "</zep-answers/smartctl/nvme0n1 does not exist>");
 }
 
+TEST_F(HealthTest, ARecordNamesItsDisk) {
+  TRecord const record = HealthRecord("nvme0n1", NoSmartReport(TMissing()));
+  EXPECT_EQ(LineOf(record, "ElementName"), "Health of nvme0n1");
+  EXPECT_EQ(LineOf(record, "Disk"), "nvme0n1");
+}
+
 TEST_F(HealthTest, AttributesAreInstances) {
   TSmartAttribute attribute;
   attribute.fId = 5;
