@@ -40,7 +40,7 @@ void AskDifferentProcessors(TRuleRun& run) {
 
 // The channel of a module, as its labels name it: "P0 CHANNEL A", "CPU1_CHANNEL_B". Empty if they name none.
 std::string ChannelOf(TElement const& module) {
-  static std::regex const pattern("(.*CHANNEL[ _]?[A-P0-9])(?![A-Z0-9]{2}).*", std::regex::icase);
+  static std::regex const pattern("(.*CHANNEL[ _]?(?:[A-P]|[0-9]+))(?![A-Z0-9]{2}).*", std::regex::icase);
   for (char const* property : {"BankLabel", "ElementName"}) {
     auto const text = module.Text(property);
     std::smatch match;

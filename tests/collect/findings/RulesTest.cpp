@@ -394,6 +394,7 @@ TEST(RulesTest, ModulesAreComparedWithinTheirChannel) {
   EXPECT_THAT(Problems("memory-differs", Module("0", "P0 CHANNEL A", "8") + Module("1", "P0 CHANNEL A", "16")),
               ElementsAre("warning: the memory modules of the channel P0 CHANNEL A do not match (Capacity: 16, 8)"));
   EXPECT_THAT(Problems("memory-differs", Module("0", "P0 CHANNEL A", "8") + Module("1", "P0 CHANNEL B", "16")), IsEmpty());
+  EXPECT_THAT(Problems("memory-differs", Module("0", "P0 CHANNEL 10", "8") + Module("1", "P0 CHANNEL 1", "16")), IsEmpty());
   EXPECT_EQ(Outcome("memory-differs", Module("0", "BANK 0", "8") + Module("1", "BANK 0", "16")), "not-asked");
 }
 
@@ -407,6 +408,8 @@ TEST(RulesTest, ModulesAreNotComparedIfTheirLabelsNameNoChannel) {
                     {"ChannelA-DIMM0", "BANK 0", "ChannelA"},
                     {"Controller1-ChannelB-DIMM1", "BANK 3", "Controller1-ChannelB"},
                     {"CPU1_CHANNEL_B_DIMM0", "", "CPU1_CHANNEL_B"},
+                    {"P0_Node0_Channel10_Dimm0", "", "P0_Node0_Channel10"},
+                    {"DIMM 0", "P0 CHANNEL 11", "P0 CHANNEL 11"},
                     {"A1", "", nullptr},
                     {"PROC 2 DIMM 12", "Not Specified", nullptr},
                     {"DIMM_A1", "BANK 0", nullptr},
