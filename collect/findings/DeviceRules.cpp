@@ -57,21 +57,26 @@ std::set<std::string> DevicesOfDisplays(TRuleRun const& run, std::map<std::strin
   return devices;
 }
 
-// The functions of a device share its link, which is judged once, with the first function.
-bool IsFirstFunction(std::string const& address) { return address.substr(DeviceOf(address).size()) == ".0"; }
+using TLinkEnds = std::map<std::string, TLinkEnd>;  // by address
+
+// The functions of a device share its link, which is judged once, with the lowest function. Function 0 may be missing, such as in
+// a virtual machine.
+bool IsFirstFunction(std::string const& address, TLinkEnds const& ends) {
+  return ends.lower_bound(DeviceOf(address))->first == address;
+}
 
 void AskPciLink(TRuleRun& run) {
   auto const links = run.Elements("ZEP_PCIExpressLink");
   auto const bridges = BridgesOf(run);
   auto const displays = DevicesOfDisplays(run, bridges);
-  std::map<std::string, TLinkEnd> ends;
+  TLinkEnds ends;
   for (TElement const& link : links) ends[link.NameIn("DeviceID")] = LinkEndOf(link);
 
   for (TElement const& link : links) {
     std::string const address = link.NameIn("DeviceID");
     auto const bridge = bridges.find(address);
     if (bridge == bridges.end() || ends.count(bridge->second) == 0) continue;  // an end of no link, or its upper end
-    if (!IsFirstFunction(address)) continue;
+    if (!IsFirstFunction(address, ends)) continue;
     TLinkEnd const &lower = ends[address], &upper = ends[bridge->second];
     if (!lower.fWidth || *lower.fWidth == 0 || !lower.fMaxWidth || !upper.fMaxWidth) continue;
     run.Know(link, link.Number("Width"));

@@ -281,6 +281,23 @@ TEST(RulesTest, TheFunctionsOfADeviceShareOneLink) {
   std::string const sound = R"(instance of CIM_PCIDevice as $second { DeviceID = "01:00.1"; ClassCode = 4; };)" + second;
   EXPECT_THAT(Problems("pci-link", Link(slow, "3") + sound), IsEmpty()) << "the sound of a display controller";
   EXPECT_THAT(Problems("pci-link", Link(slow, "2") + sound), testing::SizeIs(1)) << "one finding for both functions";
+  std::string const noLink = "Width = 0;";
+  EXPECT_THAT(Problems("pci-link", Link(noLink, "2") + sound), IsEmpty()) << "the first function decides";
+}
+
+TEST(RulesTest, ADeviceWithoutFunction0IsJudgedByItsLowestFunction) {
+  auto const functions = [](std::string const& state) {
+    std::string text = R"(instance of CIM_PCIDevice as $bridge { DeviceID = "00:01.0"; ClassCode = 6; };
+                          instance of ZEP_PCIExpressLink { DeviceID = "00:01.0"; Width = 4; MaxWidth = 16; };)";
+    for (std::string const name : {"01:00.2", "01:00.1"})
+      text += "instance of CIM_PCIDevice as $f" + name.substr(6) + " { DeviceID = \"" + name + "\"; ClassCode = 2; };" +
+              "instance of CIM_ControlledBy { Antecedent = $bridge; Dependent = $f" + name.substr(6) + "; };" +
+              "instance of ZEP_PCIExpressLink { DeviceID = \"" + name + "\"; " + state + " };";
+    return text;
+  };
+  EXPECT_THAT(Problems("pci-link", functions("Width = 4; MaxWidth = 8;")),
+              ElementsAre("warning: the PCI Express link of 01:00.1 has 4 of the 8 lanes that both ends have"));
+  EXPECT_THAT(Problems("pci-link", functions("Width = 8; MaxWidth = 8;")), IsEmpty());
 }
 
 TEST(RulesTest, TheSwitchOfAGraphicsCardMayBeSlow) {
