@@ -144,19 +144,26 @@ bool WasRemoved(TRuleRun const& run, std::string const& disk) {
   });
 }
 
+constexpr char const* kVanished = ", which has vanished since";
+
 void AddDiskProblem(TRuleRun& run, std::string const& disk, std::uint64_t severity, TRepeated const& problem) {
   bool const wasRemoved = WasRemoved(run, disk);
   AddProblem(run, problem, severity == kMinor || wasRemoved ? ESeverity::kWarning : ESeverity::kError,
-             "the kernel reports an input or output error of the disk " + disk +
-                 (wasRemoved ? ", which has vanished since" : "") + Often(problem) + MessageOf(problem),
+             "the kernel reports an input or output error of the disk " + disk + (wasRemoved ? kVanished : "") + Often(problem) +
+                 MessageOf(problem),
              wasRemoved ? "Check its cable and power, unless it was removed on purpose."
                         : "Save the data; check cable and power of the disk, and its health (smartctl -x), and replace it.");
 }
 
 void AddFileSystemProblem(TRuleRun& run, std::string const& device, TRepeated const& problem) {
-  AddProblem(run, problem, ESeverity::kError,
-             "the kernel reports an error of the file system on " + device + Often(problem) + MessageOf(problem),
-             "Save the data, look for errors of the disk, and check the file system while it is not mounted (fsck).");
+  bool const wasRemoved = WasRemoved(run, device);
+  AddProblem(run, problem, wasRemoved ? ESeverity::kWarning : ESeverity::kError,
+             "the kernel reports an error of the file system on " + device + (wasRemoved ? kVanished : "") + Often(problem) +
+                 MessageOf(problem),
+             wasRemoved
+                 ? "Check the cable and power of the disk, unless it was removed on purpose, and the file system before it is "
+                   "mounted again (fsck)."
+                 : "Save the data, look for errors of the disk, and check the file system while it is not mounted (fsck).");
 }
 
 void AskDisks(TRuleRun& run) {

@@ -69,6 +69,17 @@ TEST(LogRulesTest, ADiskThatHasVanishedSinceIsAWarning) {
                           "1 minute ago (text 2)"));
 }
 
+TEST(LogRulesTest, TheFileSystemOfAVanishedDiskIsAWarning) {
+  std::string const disks = "instance of CIM_DiskDrive { DeviceID = \"sda\"; };";
+  EXPECT_THAT(
+      Problems("disk-errors", disks + Record(1, kFileSystem, kMajor, "sda1", 60) + Record(2, kFileSystem, kMajor, "sdb1", 60) +
+                                  Record(3, kFileSystem, kMajor, "dm-0", 60)),
+      ElementsAre("error: the kernel reports an error of the file system on dm-0, 1 minute ago (text 3)",
+                  "error: the kernel reports an error of the file system on sda1, 1 minute ago (text 1)",
+                  "warning: the kernel reports an error of the file system on sdb1, which has vanished since, 1 minute "
+                  "ago (text 2)"));
+}
+
 TEST(LogRulesTest, OldRecordsAreNotJudged) {
   std::string const old = Record(1, kOutOfMemory, kMajor, "tail", 7 * kDay + 1);
   EXPECT_THAT(Problems("out-of-memory", old), IsEmpty());
