@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "TKernelEvent.h"
 
+#include <algorithm>
 #include <charconv>
 #include <utility>
 
@@ -50,7 +51,7 @@ std::string Between(TView text, TView before, TView after) {
 using TSubject = std::string (*)(TView text);
 
 std::string None(TView) { return ""; }
-std::string Process(TView text) { return Between(text, "(", ") "); }
+std::string Process(TView text) { return Between(text.substr(std::min(text.find(" process "), text.size())), "(", ") "); }
 std::string FirstWord(TView text) { return std::string(text.substr(0, text.find_first_of(": "))); }
 std::string SecondWord(TView text) { return Between(text, " ", ": "); }
 std::string Cpu(TView text) { return "CPU " + Between(text, "CPU ", ":"); }
@@ -74,6 +75,7 @@ struct TPattern {
 using TEvent = TKernelEvent;
 constexpr TPattern kPatterns[] = {
     {"Out of memory: Kill", "", TEvent::kOutOfMemory, TEvent::kMajor, Process},
+    {"Out of memory (oom_kill_allocating_task): Kill", "", TEvent::kOutOfMemory, TEvent::kMajor, Process},
     {"Memory cgroup out of memory: Kill", "", TEvent::kOutOfMemory, TEvent::kMinor, Process},
     {"mce: [Hardware Error]: CPU ", ": Machine Check Exception: ", TEvent::kProcessor, TEvent::kCritical, Cpu},
     {"mce: [Hardware Error]: CPU ", ": Machine Check: ", TEvent::kProcessor, TEvent::kDegraded, Cpu},
@@ -96,6 +98,10 @@ constexpr TPattern kPatterns[] = {
     {"", "I/O error, dev ", TEvent::kDisk, TEvent::kMajor, Device},
     {"", "critical medium error, dev ", TEvent::kDisk, TEvent::kMajor, Device},
     {"", "critical target error, dev ", TEvent::kDisk, TEvent::kMajor, Device},
+    {"", "timeout error, dev ", TEvent::kDisk, TEvent::kMajor, Device},
+    {"", "protection error, dev ", TEvent::kDisk, TEvent::kMajor, Device},
+    {"", "device offline error, dev ", TEvent::kDisk, TEvent::kMajor, Device},
+    {"", "recoverable transport error, dev ", TEvent::kDisk, TEvent::kMinor, Device},
     {"md/", ": Disk failure on ", TEvent::kDisk, TEvent::kMinor, MdDevice},
     {"Buffer I/O error on dev dm-", "", TEvent::kDisk, TEvent::kMajor, BufferDevice},
     {"Buffer I/O error on dev md", "", TEvent::kDisk, TEvent::kMajor, BufferDevice},
