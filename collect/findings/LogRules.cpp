@@ -50,6 +50,7 @@ void NoteMissingRecords(TRuleRun& run, TElement const& log) {
   run.Know(log, log.Number("CurrentNumberOfRecords"));
   NoteCount(run, log, "GoneRecords", "older records of the log are gone: ");
   NoteCount(run, log, "LeftOutRecords", "older records about errors were left out: ");
+  NoteCount(run, log, "UnreadableRecords", "records of the log have an unknown form: ");
 }
 
 // The records of these kinds that are young enough. Without the log, notes why the rule could not be asked.

@@ -48,6 +48,7 @@ TRecord KernelLogRecord(TKernelLog const& log) {
   record.AddOwn("LogState", TCIMValue(std::uint16_t{2})).Names(kLogStateNames);                // normal
   record.Add("GoneRecords", TFinding<std::uint64_t>(log.fGone));
   record.Add("LeftOutRecords", TFinding<std::uint64_t>(log.fLeftOut));
+  record.Add("UnreadableRecords", TFinding<std::uint64_t>(log.fUnreadable));
   return record;
 }
 

@@ -58,7 +58,8 @@ inline constexpr char const* kRuleClasses = R"(
   class ZEP_PCIErrors { [key] string InstanceID; string ElementName; uint64 CorrectableErrors; uint64 NonFatalErrors;
     uint64 FatalErrors; };
   class CIM_PowerSupply { [key] string DeviceID; string ElementName; uint16 OperationalStatus[]; };
-  class ZEP_KernelLog { [key] string InstanceID; uint64 CurrentNumberOfRecords; uint64 GoneRecords; uint64 LeftOutRecords; };
+  class ZEP_KernelLog { [key] string InstanceID; uint64 CurrentNumberOfRecords; uint64 GoneRecords; uint64 LeftOutRecords;
+    uint64 UnreadableRecords; };
   class ZEP_KernelLogRecord { [key] string RecordID; string RecordData; uint16 PerceivedSeverity; uint16 Kind; string Subject;
     uint64 Age; };
   class CIM_Processor { [key] string DeviceID; string ElementName; string Stepping; };

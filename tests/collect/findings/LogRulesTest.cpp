@@ -97,9 +97,10 @@ TEST(LogRulesTest, AProblemNamesTheNewestRecordAndARemedy) {
 }
 
 TEST(LogRulesTest, ALogWithoutErrorsIsFine) {
-  auto const log = [](char const* records, int gone, int leftOut) {
+  auto const log = [](char const* records, int gone, int leftOut, int unreadable = 0) {
     return std::string("instance of ZEP_KernelLog { InstanceID = \"ZEP:log:kernel\"; CurrentNumberOfRecords = ") + records +
-           "; GoneRecords = " + std::to_string(gone) + "; LeftOutRecords = " + std::to_string(leftOut) + "; };";
+           "; GoneRecords = " + std::to_string(gone) + "; LeftOutRecords = " + std::to_string(leftOut) +
+           "; UnreadableRecords = " + std::to_string(unreadable) + "; };";
   };
   for (char const* rule : {"out-of-memory", "hardware-errors", "disk-errors"}) EXPECT_EQ(Outcome(rule, log("9", 0, 0)), "fine");
   auto const notAsked = [](std::string const& instances) {
@@ -112,6 +113,7 @@ TEST(LogRulesTest, ALogWithoutErrorsIsFine) {
   EXPECT_THAT(notAsked(log("9", 0, 0)), IsEmpty());
   EXPECT_THAT(notAsked(log("9", 7, 0)), ElementsAre("older records of the log are gone: 7"));
   EXPECT_THAT(notAsked(log("9", 0, 50)), ElementsAre("older records about errors were left out: 50"));
+  EXPECT_THAT(notAsked(log("9", 0, 0, 2)), ElementsAre("records of the log have an unknown form: 2"));
   EXPECT_THAT(notAsked(log("NULL", 0, 0)), testing::SizeIs(1)) << "not all records were read";
   EXPECT_EQ(Outcome("disk-errors", Record(1, kOutOfMemory, kMajor, "tail", 10)), "fine");
 }

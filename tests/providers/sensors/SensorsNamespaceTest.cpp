@@ -55,7 +55,7 @@ TEST_F(SensorsNamespaceTest, ErrorsBelongToTheSystem) {
 TEST_F(SensorsNamespaceTest, ErrorsInTheLogBelongToTheLogOfTheSystem) {
   Write("proc/uptime", "100.5 1.0\n");
   Write("proc/stat", "cpu 0\nbtime 1700000000\n");
-  Write("dev/kmsg", "3,7,40000001,-;critical medium error, dev sda, sector 4656\n6,8,40000002,-;fine\n");
+  Write("dev/kmsg", "3,7,40000001,-;critical medium error, dev sda, sector 4656\n6,8,40000002,-;fine\nunknown form\n");
   Fill();
   std::string const text = TextOf(*fNs);
   EXPECT_THAT(text, HasSubstr("MessageTimestamp=\"20231114221400.000001+000\""));
@@ -64,6 +64,7 @@ TEST_F(SensorsNamespaceTest, ErrorsInTheLogBelongToTheLogOfTheSystem) {
   EXPECT_THAT(text, HasSubstr("Age: 60"));
   EXPECT_THAT(text, HasSubstr("CurrentNumberOfRecords: 2"));
   EXPECT_THAT(text, HasSubstr("GoneRecords: 7"));
+  EXPECT_THAT(text, HasSubstr("UnreadableRecords: 1"));
   EXPECT_THAT(text, HasSubstr("CIM_LogManagesRecord"));
   EXPECT_THAT(text, HasSubstr("CIM_UseOfLog"));
 }
