@@ -45,9 +45,10 @@ void AskPortErrors(TRuleRun& run) {
     std::uint64_t const packets = SumOf(statistics, {"PacketsReceived", "PacketsTransmitted"}) + errors;
     if (errors < fewest || errors * million / packets < run.Thresholds().fPortErrorsPerMillion) continue;
     run.Add(statistics, statistics.Number("ReceiveErrors").fSource, ESeverity::kWarning,
-            "the network interface " + statistics.Label() + " has " + std::to_string(errors) + " errors in " +
-                std::to_string(packets) + " packets",
-            kCheckCable);
+            "the network interface " + statistics.Label() + " has had " + std::to_string(errors) + " errors in " +
+                std::to_string(packets) + " packets since the start",
+            kCheckCable + std::string(" The counters begin at 0 when the driver of the interface is loaded again (modprobe -r, "
+                                      "modprobe), or when the machine is restarted."));
   }
 }
 

@@ -163,7 +163,8 @@ std::string Statistics(int received, int errors) {
 
 TEST(RulesTest, ErrorsOfAPortAreJudgedByTheirShare) {
   EXPECT_THAT(Problems("port-errors", Statistics(1000000, 11)),
-              ElementsAre("warning: the network interface eth0 has 11 errors in 1000011 packets"));
+              ElementsAre("warning: the network interface eth0 has had 11 errors in 1000011 packets since the start"));
+  EXPECT_THAT(FindingsOf(Statistics(1000000, 11)).fProblems.at(0).fRemedy, testing::HasSubstr("counters begin at 0"));
   EXPECT_THAT(Problems("port-errors", Statistics(2000000, 11)), IsEmpty());
   EXPECT_THAT(Problems("port-errors", Statistics(100, 9)), IsEmpty()) << "too few to judge";
 }
