@@ -235,15 +235,38 @@ TEST_F(RecordedFaultsTest, OfPortsAndLinks) {
   std::string const settings = kAnswers + "ethtool/eth1/linksettings";
   std::string const width8 = "8\n", rate8 = "8.0 GT/s PCIe\n", rate2 = "2.5 GT/s PCIe\n";
   TRow const rows[] = {
-      {"warning port-slow", "cable", {{settings, Patched(speed, Bytes({100, 0, 0, 0}))}}},
-      {"warning port-half-duplex", "negotiate", {{settings, Patched(duplex, Bytes({0}))}}},
-      {"error bond-member", "cable", {{kEthernet + "bonding_slave/mii_status", Content("down\n")}}},
+      {"warning port-slow",
+       "cable",
+       {{settings, Patched(speed, Bytes({100, 0, 0, 0}))}},
+       "the network port eth1 runs at 100 Mbit/s, although it can run at 1000"},
+      {"warning port-half-duplex",
+       "negotiate",
+       {{settings, Patched(duplex, Bytes({0}))}},
+       "the network port eth1 uses half duplex"},
+      {"error bond-member",
+       "cable",
+       {{kEthernet + "bonding_slave/mii_status", Content("down\n")}},
+       "the bond bond0 lacks its member eth1, which has no link"},
       {"warning pci-link",
        "riser",
-       {{kCard + "max_link_width", Content(width8)}, {kCard + "current_link_width", Content("4\n")}}},
-      {"warning pci-link", "riser", {{kCard + "max_link_speed", Content(rate8)}, {kCard + "current_link_speed", Content(rate2)}}},
-      {"error pci-errors", "riser", {{kPort + "aer_dev_fatal", Replaced("TOTAL_ERR_FATAL 0", "TOTAL_ERR_FATAL 1")}}},
-      {"warning pci-errors", "riser", {{kPort + "aer_dev_correctable", Replaced("TOTAL_ERR_COR 0", "TOTAL_ERR_COR 1001")}}},
+       {{kCard + "max_link_width", Content(width8)}, {kCard + "current_link_width", Content("4\n")}},
+       "the PCI Express link of 0000:01:00.0 has 4 of the 8 lanes that both ends have"},
+      {"warning pci-link",
+       "riser",
+       {{kCard + "max_link_speed", Content(rate8)}, {kCard + "current_link_speed", Content(rate2)}},
+       "the PCI Express link of 0000:01:00.0 runs at 2.5 GT/s, although both ends can run at 8 GT/s"},
+      {"error pci-errors",
+       "riser",
+       {{kPort + "aer_dev_fatal", Replaced("TOTAL_ERR_FATAL 0", "TOTAL_ERR_FATAL 1")}},
+       "the PCI Express device 0000:00:03.0 has had fatal errors: 1"},
+      {"warning pci-errors",
+       "riser",
+       {{kPort + "aer_dev_nonfatal", Replaced("TOTAL_ERR_NONFATAL 0", "TOTAL_ERR_NONFATAL 1")}},
+       "the PCI Express device 0000:00:03.0 has had uncorrected errors: 1"},
+      {"warning pci-errors",
+       "riser",
+       {{kPort + "aer_dev_correctable", Replaced("TOTAL_ERR_COR 0", "TOTAL_ERR_COR 1001")}},
+       "the PCI Express device 0000:00:03.0 has had corrected errors: 1001"},
   };
   ExpectFoundAndGone(rows);
 }
@@ -260,8 +283,12 @@ TEST_F(RecordedFaultsTest, OfPortsOfABridge) {
   TRow const rows[] = {
       {"warning port-errors",
        "cable",
-       {{kEthernet + "statistics/rx_packets", Content("100000\n")}, {kEthernet + "statistics/rx_errors", Content("10\n")}}},
-      {"error port-unplugged", "cable", {{kEthernet + "operstate", Content("down\n")}, {kEthernet + "carrier", Content("0\n")}}}};
+       {{kEthernet + "statistics/rx_packets", Content("100000\n")}, {kEthernet + "statistics/rx_errors", Content("10\n")}},
+       "the network interface eth1 has had 10 errors in 100"},
+      {"error port-unplugged",
+       "cable",
+       {{kEthernet + "operstate", Content("down\n")}, {kEthernet + "carrier", Content("0\n")}},
+       "the network port eth1 is in use, but has no link"}};
   ExpectFoundAndGone(rows);
 }
 
@@ -278,38 +305,80 @@ TEST_F(RecordedFaultsTest, OfSensorsAndMemory) {
   ExpectFoundAndGone(rows);
 }
 
-// The second module, in the channel of the first and smaller. Its strings follow its fields; the length is the second byte.
-std::string WithSmallerModule(std::string table) {
-  constexpr char type = 17;
-  std::size_t const strings = table.find("DIMM 1");
-  std::size_t start = strings - 2;
-  while (table[start] != type || static_cast<std::uint8_t>(table[start + 1]) != strings - start) --start;
-  table[start + 0x0C] = 64;  // MiB
-  return Replaced("P0 channel 1", "P0 channel 0")(table);
+// Makes the second module one of the channel of the first, with other bytes at that offset of its SMBIOS structure. The strings
+// of a structure follow its fields; the length of the fields is its second byte.
+TFault OtherModule(std::size_t offset, std::string const& bytes) {
+  return [offset, bytes](std::string table) {
+    constexpr char type = 17;
+    std::size_t const strings = table.find("DIMM 1");
+    std::size_t start = strings - 2;
+    while (table[start] != type || static_cast<std::uint8_t>(table[start + 1]) != strings - start) --start;
+    table.replace(start + offset, bytes.size(), bytes);
+    return Replaced("P0 channel 1", "P0 channel 0")(table);
+  };
+}
+
+TFault OtherProcessor(std::string const& from, std::string const& to) {
+  return [from, to](std::string const& text) {
+    std::size_t const second = text.find("processor\t: 2");  // each has two cores
+    EXPECT_NE(text.find(from, second), std::string::npos) << from;
+    return text.substr(0, second) + std::regex_replace(text.substr(second), std::regex(from), to);
+  };
 }
 
 TEST_F(RecordedFaultsTest, OfTheSystem) {
   std::string const unit = R"([{"unit":"backup.service","load":"loaded","active":"failed","sub":"failed","description":"b"}])";
-  TFault const secondProcessor = [](std::string text) {
-    std::size_t const second = text.find("processor\t: 2");  // each has two cores
-    return text.substr(0, second) + std::regex_replace(text.substr(second), std::regex("0x1000065"), "0x1000064");
-  };
+  std::string const modules = "sys/firmware/dmi/tables/DMI";
+  constexpr std::size_t size = 0x0C, memoryType = 0x12, memorySpeed = 0x15;  // in the structure of a module
   TRow const rows[] = {
-      {"warning processors-differ", "microcode", {{"proc/cpuinfo", secondProcessor}}},
-      {"warning memory-differs", "same size", {{"sys/firmware/dmi/tables/DMI", WithSmallerModule}}},
+      {"warning processors-differ",
+       "microcode",
+       {{"proc/cpuinfo", OtherProcessor("0x1000065", "0x1000064")}},
+       "the processors have different microcode (MicrocodeVersion: 0x1000064, 0x1000065)"},
+      {"warning processors-differ",
+       "same model and stepping",
+       {{"proc/cpuinfo", OtherProcessor("stepping\t: 1", "stepping\t: 2")}},
+       "the processors are of different kinds (Stepping: 1, 2)"},
+      {"warning memory-differs",
+       "same size",
+       {{modules, OtherModule(size, Bytes({64}))}},
+       "the memory modules of the channel P0 channel 0 do not match (Capacity: 134217728, 67108864)"},
+      {"warning memory-differs",
+       "same size, type",
+       {{modules, OtherModule(memoryType, Bytes({0x18}))}},
+       "the memory modules of the channel P0 channel 0 do not match (MemoryType: 24, 26)"},
+      {"warning memory-differs",
+       "type and speed",
+       {{modules, OtherModule(memorySpeed, Bytes({0x60, 0x09}))}},
+       "the memory modules of the channel P0 channel 0 do not match (MaxMemorySpeed: 2400, 3200)"},
       {"information processor-weakness",
        "Update the kernel",
-       {{"sys/devices/system/cpu/vulnerabilities/meltdown", Content("Vulnerable\n")}}},
-      {"warning clock-synchronized", "time service", {{kAnswers + "adjtimex", Patched(kClockStatus, Bytes({0x40}))}}},
-      {"error kernel-taint", "journalctl -k", {{"proc/sys/kernel/tainted", Content("128\n")}}},
-      {"warning failed-units", "systemctl status", {{kAnswers + "systemctl/failed", Content(unit)}}},
+       {{"sys/devices/system/cpu/vulnerabilities/meltdown", Content("Vulnerable\n")}},
+       "the kernel mitigates some weaknesses of the processor incompletely or not at all: meltdown"},
+      {"warning clock-synchronized",
+       "time service",
+       {{kAnswers + "adjtimex", Patched(kClockStatus, Bytes({0x40}))}},
+       "the clock is not synchronised"},
+      {"error kernel-taint",
+       "journalctl -k",
+       {{"proc/sys/kernel/tainted", Content("128\n")}},
+       "the kernel has had an internal error (OOPS or BUG) since the start"},
+      {"warning failed-units",
+       "systemctl status",
+       {{kAnswers + "systemctl/failed", Content(unit)}},
+       "units of systemd have failed: backup.service"},
       {"warning out-of-memory",
        "MemoryMax",
-       {{"dev/kmsg", Content("3,1,1000000,-;Memory cgroup out of memory: Killed process 158 (tail) total-vm:7048kB\n")}}},
+       {{"dev/kmsg", Content("3,1,1000000,-;Memory cgroup out of memory: Killed process 158 (tail) total-vm:7048kB\n")}},
+       "the kernel killed the process tail because its control group had reached its memory limit, 1 hour ago"},
       {"error hardware-errors",
        "management controller",
-       {{"dev/kmsg", Content("2,1,1000000,-;{1}[Hardware Error]: event severity: fatal\n")}}},
-      {"error disk-errors", "smartctl", {{"dev/kmsg", Content("3,1,1000000,-;I/O error, dev sda, sector 8 op 0x1:(WRITE)\n")}}},
+       {{"dev/kmsg", Content("2,1,1000000,-;{1}[Hardware Error]: event severity: fatal\n")}},
+       "the kernel reports an error of the hardware, 1 hour ago"},
+      {"error disk-errors",
+       "smartctl",
+       {{"dev/kmsg", Content("3,1,1000000,-;I/O error, dev sda, sector 8 op 0x1:(WRITE)\n")}},
+       "the kernel reports an input or output error of the disk sda, 1 hour ago"},
   };
   ExpectFoundAndGone(rows);
 }
