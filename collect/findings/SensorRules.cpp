@@ -94,20 +94,28 @@ std::string FaultyModule(TElement const& errors) {
 }
 
 void AskMemoryErrors(TRuleRun& run) {
+  std::string const since = " since the start: ",
+                    reset =
+                        " The counters begin at 0 when 1 is written to reset_counters of the memory controller (below "
+                        "/sys/devices/system/edac/mc), or when the machine is restarted.";
   for (TElement const& errors : run.Elements("ZEP_MemoryErrors")) {
     auto const corrected = errors.Number("CorrectedErrors"), uncorrected = errors.Number("UncorrectedErrors");
     std::string const place = "the memory " + errors.Label() + " has had ", module = FaultyModule(errors);
     if (run.Know(errors, uncorrected) && *uncorrected.fValue > 0)
       run.Add(errors, uncorrected.fSource, ESeverity::kCritical,
-              place + "uncorrected errors: " + std::to_string(*uncorrected.fValue), "Replace " + module + ".");
+              place + "uncorrected errors" + since + std::to_string(*uncorrected.fValue), "Replace " + module + "." + reset);
     if (run.Know(errors, corrected) && *corrected.fValue > run.Thresholds().fCorrectedMemoryErrors)
-      run.Add(errors, corrected.fSource, ESeverity::kWarning, place + "corrected errors: " + std::to_string(*corrected.fValue),
-              "Watch the number, and replace " + module + " if it grows.");
+      run.Add(errors, corrected.fSource, ESeverity::kWarning,
+              place + "corrected errors" + since + std::to_string(*corrected.fValue),
+              "Watch the number, and replace " + module + " if it grows." + reset);
   }
 }
 
 void AskPciErrors(TRuleRun& run) {
-  constexpr char const* remedy = "Seat the card anew; if the number grows, replace the card or the riser.";
+  constexpr char const* remedy =
+      "Seat the card anew; if the number grows, replace the card or the riser. The counters begin at 0 when the device is "
+      "removed "
+      "and found again, or when the machine is restarted.";
   for (TElement const& errors : run.Elements("ZEP_PCIErrors")) {
     std::string const place = "the PCI Express device " + errors.Label() + " has had ";
     auto const report = [&](char const* property, char const* kind, ESeverity severity, std::uint64_t highest) {
@@ -115,9 +123,9 @@ void AskPciErrors(TRuleRun& run) {
       if (run.Know(errors, count) && *count.fValue > highest)
         run.Add(errors, count.fSource, severity, place + kind + std::to_string(*count.fValue), remedy);
     };
-    report("FatalErrors", "fatal errors: ", ESeverity::kError, 0);
-    report("NonFatalErrors", "uncorrected errors: ", ESeverity::kWarning, 0);
-    report("CorrectableErrors", "corrected errors: ", ESeverity::kWarning, run.Thresholds().fCorrectedPciErrors);
+    report("FatalErrors", "fatal errors since the start: ", ESeverity::kError, 0);
+    report("NonFatalErrors", "uncorrected errors since the start: ", ESeverity::kWarning, 0);
+    report("CorrectableErrors", "corrected errors since the start: ", ESeverity::kWarning, run.Thresholds().fCorrectedPciErrors);
   }
 }
 

@@ -12,6 +12,7 @@ namespace {
 
 using testing::ElementsAre;
 using testing::IsEmpty;
+using testing::StartsWith;
 
 // ---- Network ----
 
@@ -224,16 +225,16 @@ TEST(RulesTest, ErrorsOfMemoryAndPciDevicesAreCounted) {
   EXPECT_THAT(Problems("memory-errors", R"(
       instance of ZEP_MemoryErrors { InstanceID = "1"; ElementName = "A1"; CorrectedErrors = 101; UncorrectedErrors = 2; };
       instance of ZEP_MemoryErrors { InstanceID = "2"; ElementName = "A2"; CorrectedErrors = 100; UncorrectedErrors = 0; };)"),
-              ElementsAre("critical: the memory A1 has had uncorrected errors: 2",
-                          "warning: the memory A1 has had corrected errors: 101"));
+              ElementsAre("critical: the memory A1 has had uncorrected errors since the start: 2",
+                          "warning: the memory A1 has had corrected errors since the start: 101"));
   EXPECT_THAT(Problems("pci-errors", R"(
       instance of ZEP_PCIErrors { InstanceID = "1"; ElementName = "01:00.0"; CorrectableErrors = 1001; NonFatalErrors = 1;
                                   FatalErrors = 3; };
       instance of ZEP_PCIErrors { InstanceID = "2"; ElementName = "02:00.0"; CorrectableErrors = 1000; NonFatalErrors = 0;
                                   FatalErrors = 0; };)"),
-              ElementsAre("error: the PCI Express device 01:00.0 has had fatal errors: 3",
-                          "warning: the PCI Express device 01:00.0 has had uncorrected errors: 1",
-                          "warning: the PCI Express device 01:00.0 has had corrected errors: 1001"));
+              ElementsAre("error: the PCI Express device 01:00.0 has had fatal errors since the start: 3",
+                          "warning: the PCI Express device 01:00.0 has had uncorrected errors since the start: 1",
+                          "warning: the PCI Express device 01:00.0 has had corrected errors since the start: 1001"));
 }
 
 TEST(RulesTest, ErrorsOfNoModuleHaveARemedyOfTheirOwn) {
@@ -242,9 +243,9 @@ TEST(RulesTest, ErrorsOfNoModuleHaveARemedyOfTheirOwn) {
     auto const problems = FindingsOf(errors + Missing("ZEP_MemoryErrors.InstanceID=\\\"1\\\"", "Location", code)).fProblems;
     return problems.size() == 1 ? problems[0].fRemedy : "";
   };
-  EXPECT_EQ(remedyOf("not-given"), "Replace the memory module.");
-  EXPECT_EQ(remedyOf("not-applicable"),
-            "Replace the faulty memory module (a memory test or the controller's event log may name it).");
+  EXPECT_THAT(remedyOf("not-given"), StartsWith("Replace the memory module. The counters begin at 0 when"));
+  EXPECT_THAT(remedyOf("not-applicable"),
+              StartsWith("Replace the faulty memory module (a memory test or the controller's event log may name it). "));
 }
 
 // ---- Host ----

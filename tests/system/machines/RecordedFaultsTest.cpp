@@ -3,148 +3,19 @@
 // Every fault that files of the kernel or answers of programs and controllers can show: planted in a recorded machine, it is
 // found with its rule alone, and it is gone when mended. Before and after, the rule examines the healthy values.
 
-#include "tests/Machines.h"
-#include "tests/providers/controller/ControllerBytes.h"
-#include "tests/tools/zep/Zep.h"
+#include "tests/system/machines/PlantedFaults.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <cstring>
-#include <functional>
 #include <regex>
-#include <set>
 
 namespace NQRVZEP20::zep {
 namespace {
 
-using testing::HasSubstr;
 using testing::IsEmpty;
-using testing::Not;
 
-// Returns the content of a file with the fault; an empty function removes the file.
-using TFault = std::function<std::string(std::string const& content)>;
-TFault const kRemoved;
-
-TFault Content(std::string const& content) {
-  return [content](std::string const&) { return content; };
-}
-
-TFault Replaced(std::string const& from, std::string const& to) {
-  return [from, to](std::string text) {
-    std::size_t const at = text.rfind(from);
-    EXPECT_NE(at, std::string::npos) << from;
-    return at == std::string::npos ? text : text.replace(at, from.size(), to);
-  };
-}
-
-TFault Patched(std::size_t offset, std::string const& bytes) {
-  return [offset, bytes](std::string content) { return content.replace(offset, bytes.size(), bytes); };
-}
-
-struct TRow {
-  char const* fProblem;  // severity and rule
-  char const* fRemedy;   // a part of it
-  std::vector<std::pair<std::string, TFault>> fChanges;
-  char const* fReason = "";  // a part of it
-};
-
-std::string const kPort = "sys/devices/pci0000:00/0000:00:03.0/", kCard = kPort + "0000:01:00.0/";
-std::string const kDisk = kCard + "0000:02:00.0/0000:03:00.0/", kSensor = kDisk + "nvme/nvme0/hwmon0/";
-std::string const kEthernet = kCard + "0000:02:01.0/0000:04:00.0/net/eth1/";
-std::string const kSupply = "sys/class/power_supply/", kModules = "sys/devices/system/edac/mc/mc0/";
-std::string const kArray = "sys/devices/virtual/block/md0/md/";
-std::string const kAnswers = "zep-answers/", kIpmi = kAnswers + "ipmi/";
-constexpr std::size_t kClockStatus = 40;  // in the structure of adjtimex
-
-class RecordedFaultsTest : public testing::Test {
-protected:
-  RecordedFaultsTest() {
-    for (char const* library :
-         {"libDevices.nsp.so", "libNetwork.nsp.so", "libStorage.nsp.so", "libSensors.nsp.so", "libController.nsp.so"})
-      fInstalled.Add(library, std::string(TEST_LIB_DIR "/") + library);
-    MakeHealthy();
-  }
-
-  // The recorded machine has no errors to count, no fan, power supply or time service, and it has just started.
-  void MakeHealthy() const {
-    for (char const* supply : {"PSU1/", "PSU2/"}) {
-      Write(kSupply + supply + "type", "Mains\n");
-      Write(kSupply + supply + "online", "1\n");
-    }
-    Write(kSensor + "fan1_input", "900\n");
-    Write(kSensor + "fan1_min", "500\n");
-    Write(kSensor + "fan1_fault", "0\n");
-    Write(kModules + "dimm0/dimm_label", "DIMM_A1\n");
-    for (char const* count : {"ce", "ue"}) Write(kModules + "dimm0/dimm_" + count + "_count", "0\n");
-    Write("dev/kmsg", ReadFile(TestDataPath("kmsg/healthy")));
-    Write("proc/uptime", "7200.00 1.00\n");
-    Write(kAnswers + "systemctl/failed", "[]\n");
-    Write(kAnswers + "adjtimex", Patched(kClockStatus, Bytes({0}))(ReadFile(Path(kAnswers + "adjtimex"))));
-  }
-
-  nlohmann::json Findings(std::vector<std::string> const& options = {}) const {
-    TCall call{{"report", "--json", "--plugin-timeout", "60"}, {{"ZEP_ROOT", fMachine.Root()}}};
-    call.fArguments.insert(call.fArguments.end(), options.begin(), options.end());
-    call.fOutputFile = fInstalled.Path("document");
-    fInstalled.Run(call);
-    return nlohmann::json::parse(ReadFile(call.fOutputFile))["findings"];
-  }
-
-  std::string Path(std::string const& path) const { return fMachine.Root() + "/" + path; }
-
-  void Write(std::string const& path, std::string const& content) const {
-    fs::create_directories(fs::path(Path(path)).parent_path());
-    WriteFile(Path(path), content);
-  }
-
-  // Each fault is mended before the next is planted, so that its problem would be found beside that of the next.
-  template <std::size_t N>
-  void ExpectFoundAndGone(TRow const (&rows)[N]) const {
-    ExpectFine(rows);
-    for (TRow const& row : rows) ExpectFound(row);
-    ExpectFine(rows);
-  }
-
-  // Without a fault, the rules of the rows have examined something, and found nothing.
-  template <std::size_t N>
-  void ExpectFine(TRow const (&rows)[N]) const {
-    nlohmann::json const findings = Findings();
-    EXPECT_THAT(findings["problems"], IsEmpty()) << findings["problems"];
-    std::set<std::string> fine;
-    for (nlohmann::json const& rule : findings["rules"])
-      if (rule["outcome"] == "fine" && rule["examined"] > 0) fine.insert(rule["id"]);
-    for (TRow const& row : rows) EXPECT_EQ(fine.count(std::strchr(row.fProblem, ' ') + 1), 1U) << row.fProblem;
-  }
-
-  void ExpectFound(TRow const& row) const {
-    SCOPED_TRACE(row.fProblem);
-    std::map<std::string, std::string> healthy;
-    for (auto const& [path, fault] : row.fChanges) {
-      ASSERT_TRUE(fs::exists(Path(path))) << path;
-      std::string const content = ReadFile(Path(path));
-      healthy.try_emplace(path, content);
-      if (fault)
-        WriteFile(Path(path), fault(content));
-      else
-        fs::remove(Path(path));
-    }
-    ExpectProblems(row, Findings()["problems"]);
-    for (auto const& [path, content] : healthy) WriteFile(Path(path), content);
-  }
-
-  static void ExpectProblems(TRow const& row, nlohmann::json const& problems) {
-    EXPECT_THAT(problems, Not(IsEmpty()));
-    for (nlohmann::json const& problem : problems) {
-      EXPECT_EQ(problem["severity"].get<std::string>() + " " + problem["rule"].get<std::string>(), row.fProblem);
-      EXPECT_THAT(problem["remedy"].get<std::string>(), HasSubstr(row.fRemedy));
-      EXPECT_THAT(problem["reason"].get<std::string>(), HasSubstr(row.fReason));
-    }
-  }
-
-  TInstallation fInstalled;
-  TRecordedMachine fMachine{"server"};
-};
+using RecordedFaultsTest = TPlantedFaults;
 
 TEST_F(RecordedFaultsTest, OfDisksAndFileSystems) {
   std::string const spare = R"("available_spare":0,"available_spare_threshold":0)";
@@ -154,7 +25,7 @@ TEST_F(RecordedFaultsTest, OfDisksAndFileSystems) {
   };
   std::string const attribute = R"({"id":197,"name":"Current_Pending_Sector","raw":{"value":8,"string":"8"}},)";
   TFault const pending = Replaced(R"("table":[{"id":1,)", R"("table":[)" + attribute + R"({"id":1,)");
-  TRow const rows[] = {
+  TFaultRow const rows[] = {
       {"critical disk-failing",
        "replace it",
        {{kAnswers + "smartctl/sda", Replaced(R"("smart_status":{"passed":true)", R"("smart_status":{"passed":false)")}},
@@ -234,7 +105,7 @@ TEST_F(RecordedFaultsTest, OfPortsAndLinks) {
   constexpr std::size_t speed = 4, duplex = 8;  // in the answer of ethtool
   std::string const settings = kAnswers + "ethtool/eth1/linksettings";
   std::string const width8 = "8\n", rate8 = "8.0 GT/s PCIe\n", rate2 = "2.5 GT/s PCIe\n";
-  TRow const rows[] = {
+  TFaultRow const rows[] = {
       {"warning port-slow",
        "cable",
        {{settings, Patched(speed, Bytes({100, 0, 0, 0}))}},
@@ -258,15 +129,15 @@ TEST_F(RecordedFaultsTest, OfPortsAndLinks) {
       {"error pci-errors",
        "riser",
        {{kPort + "aer_dev_fatal", Replaced("TOTAL_ERR_FATAL 0", "TOTAL_ERR_FATAL 1")}},
-       "the PCI Express device 0000:00:03.0 has had fatal errors: 1"},
+       "the PCI Express device 0000:00:03.0 has had fatal errors since the start: 1"},
       {"warning pci-errors",
        "riser",
        {{kPort + "aer_dev_nonfatal", Replaced("TOTAL_ERR_NONFATAL 0", "TOTAL_ERR_NONFATAL 1")}},
-       "the PCI Express device 0000:00:03.0 has had uncorrected errors: 1"},
+       "the PCI Express device 0000:00:03.0 has had uncorrected errors since the start: 1"},
       {"warning pci-errors",
        "riser",
        {{kPort + "aer_dev_correctable", Replaced("TOTAL_ERR_COR 0", "TOTAL_ERR_COR 1001")}},
-       "the PCI Express device 0000:00:03.0 has had corrected errors: 1001"},
+       "the PCI Express device 0000:00:03.0 has had corrected errors since the start: 1001"},
   };
   ExpectFoundAndGone(rows);
 }
@@ -280,7 +151,7 @@ TEST_F(RecordedFaultsTest, OfPortsOfABridge) {
     fs::remove(master);
     fs::create_symlink("/sys/devices/virtual/net/br0", master);
   }
-  TRow const rows[] = {
+  TFaultRow const rows[] = {
       {"warning port-errors",
        "cable",
        {{kEthernet + "statistics/rx_packets", Content("100000\n")}, {kEthernet + "statistics/rx_errors", Content("10\n")}},
@@ -293,7 +164,7 @@ TEST_F(RecordedFaultsTest, OfPortsOfABridge) {
 }
 
 TEST_F(RecordedFaultsTest, OfSensorsAndMemory) {
-  TRow const rows[] = {
+  TFaultRow const rows[] = {
       {"error sensor-threshold", "air flow", {{kSensor + "temp1_input", Content("100850\n")}}},
       {"warning sensor-threshold", "air flow", {{kSensor + "temp1_input", Content("75850\n")}}},
       {"warning fan-stopped", "If a fan is connected", {{kSensor + "fan1_input", Content("0\n")}}},
@@ -330,7 +201,7 @@ TEST_F(RecordedFaultsTest, OfTheSystem) {
   std::string const unit = R"([{"unit":"backup.service","load":"loaded","active":"failed","sub":"failed","description":"b"}])";
   std::string const modules = "sys/firmware/dmi/tables/DMI";
   constexpr std::size_t size = 0x0C, memoryType = 0x12, memorySpeed = 0x15;  // in the structure of a module
-  TRow const rows[] = {
+  TFaultRow const rows[] = {
       {"warning processors-differ",
        "microcode",
        {{"proc/cpuinfo", OtherProcessor("0x1000065", "0x1000064")}},
@@ -398,7 +269,7 @@ TEST_F(RecordedFaultsTest, OfTheManagementController) {
   WriteFile(Path(kIpmi + "0646-02"), Bytes({0}) + "support" + std::string(9, '\0'));
   std::string const removal = Bytes({0, 0xFF, 0xFF, 0, 0, 2, 0x23, 0x72, 3, 0x6B, 0x20, 0, 4, 8, 3, 0xEF, 0, 0xFF, 0xFF});
   std::string const memory = Bytes({0, 0xFF, 0xFF, 0, 0, 2, 0x23, 0x72, 3, 0x6B, 0x20, 0, 4, 0x0C, 9, 0x6F, 1, 0xFF, 0xFF});
-  TRow const rows[] = {
+  TFaultRow const rows[] = {
       {"error sensor-threshold", "air flow", {{kIpmi + "042d-01", Content(Bytes({0, 91, 0xC0, 0x18}))}}},
       {"error fan-stopped", "Replace the fan", {{kIpmi + "042d-02", Content(Bytes({0, 0, 0xC0, 0x07}))}}},
       {"error controller-part-failed", "replace it", {{kIpmi + "042d-03", Content(Bytes({0, 0, 0xC0, 3, 0}))}}},
