@@ -131,10 +131,29 @@ bool Has(TList const& list, std::string_view text) {
   return std::find(std::begin(list), std::end(list), text) != std::end(list);
 }
 
+// Names of classes and properties are the same in upper and lower case.
+bool IsSameName(std::string_view a, std::string_view b) {
+  return a.size() == b.size() && std::equal(a.begin(), a.end(), b.begin(), [](char x, char y) { return Lower(x) == Lower(y); });
+}
+
+struct TNameHash {
+  std::size_t operator()(std::string_view name) const {
+    std::size_t hash = 0;
+    for (char const byte : name) hash = hash * 31 + static_cast<unsigned char>(Lower(byte));
+    return hash;
+  }
+};
+
+struct TNameEqual {
+  bool operator()(std::string_view a, std::string_view b) const { return IsSameName(a, b); }
+};
+
+using TRows = std::unordered_multimap<std::string_view, TSecretProperty const*, TNameHash, TNameEqual>;
+
 // The rows for each property.
-std::unordered_multimap<std::string_view, TSecretProperty const*> const& RowsByProperty() {
+TRows const& RowsByProperty() {
   static auto const rows = [] {
-    std::unordered_multimap<std::string_view, TSecretProperty const*> map;
+    TRows map;
     for (TSecretProperty const& row : kProperties) map.emplace(row.fProperty, &row);
     return map;
   }();
@@ -142,7 +161,8 @@ std::unordered_multimap<std::string_view, TSecretProperty const*> const& RowsByP
 }
 
 bool IsOf(TSecretProperty const& row, std::vector<std::string> const& classes) {
-  return row.fClass.empty() || Has(classes, row.fClass);
+  return row.fClass.empty() ||
+         std::any_of(classes.begin(), classes.end(), [&](std::string const& each) { return IsSameName(each, row.fClass); });
 }
 
 // "0000:00:1f.2", which the kernel uses as the serial number of USB hubs.
@@ -190,7 +210,10 @@ bool DescribesSerial(std::string_view description) {
   return false;
 }
 
-bool IsFreeText(std::string_view property) { return Has(kFreeTexts, property); }
+bool IsFreeText(std::string_view property) {
+  return std::any_of(std::begin(kFreeTexts), std::end(kFreeTexts),
+                     [&](std::string_view each) { return IsSameName(each, property); });
+}
 
 bool IsPlaceholder(ESecretKind kind, std::string_view value) {
   constexpr std::size_t shortest = 3;

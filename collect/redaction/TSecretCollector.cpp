@@ -28,6 +28,20 @@ void ForEachString(TJson const& value, TUse use) {
     for (TJson const& element : value) ForEachString(element, use);
 }
 
+// The meaning of a property that a plug-in marked with a kind of secret.
+EMeaning MeaningOfKind(std::string const& kind) {
+  switch (SecretKindFrom(Lower(kind)).value_or(ESecretKind::kSerials)) {
+    case ESecretKind::kHosts:
+      return EMeaning::kHost;
+    case ESecretKind::kAddresses:
+      return EMeaning::kAddress;
+    case ESecretKind::kUsers:
+      return EMeaning::kUser;
+    default:
+      return EMeaning::kSerial;
+  }
+}
+
 // A number as a text; bytes, such as those of a MAC address, as hexadecimal digits.
 std::string TextOf(TJson const& property) {
   TJson const& value = property["value"];
@@ -54,17 +68,28 @@ void TSecretCollector::Collect(TJson& document) {
 
 void TSecretCollector::ReadClasses(TJson const& classes) {
   try {
-    for (TJson const& row : classes) fClasses[row.at("class")] = row.at("superclasses").get<std::vector<std::string>>();
+    for (TJson const& row : classes) {
+      TClass& read = fClasses[row.at("class")];
+      read.fLine = row.at("superclasses").get<std::vector<std::string>>();
+      TJson const secrets = row.value("secrets", TJson::object());
+      for (auto const& [property, kind] : secrets.get_ref<TJson::object_t const&>())
+        read.fSecrets.emplace(Lower(property), MeaningOfKind(kind.get_ref<std::string const&>()));
+    }
   } catch (TJson::exception const&) {
-    throw TRedactionError("/classes: is not a list of classes with their superclasses");
+    throw TRedactionError("/classes: is not a list of classes with their superclasses and secrets");
   }
 }
 
-// The class and its superclasses. A document without the member "classes" has only the class.
-std::vector<std::string> const& TSecretCollector::LineOf(std::string const& name) {
-  auto& line = fClasses[name];
-  if (line.empty() || line.front() != name) line.insert(line.begin(), name);
-  return line;
+// A document without the member "classes" has only the name of the class.
+TSecretCollector::TClass const& TSecretCollector::ClassOf(std::string const& name) {
+  TClass& found = fClasses[name];
+  if (found.fLine.empty() || found.fLine.front() != name) found.fLine.insert(found.fLine.begin(), name);
+  return found;
+}
+
+std::optional<EMeaning> TSecretCollector::MeaningOf(TClass const& ofInstance, std::string const& property) const {
+  auto const marked = ofInstance.fSecrets.empty() ? ofInstance.fSecrets.end() : ofInstance.fSecrets.find(Lower(property));
+  return marked == ofInstance.fSecrets.end() ? MeaningOfProperty(ofInstance.fLine, property) : marked->second;
 }
 
 void TSecretCollector::CollectRows(TJson const& rows) {
@@ -73,11 +98,11 @@ void TSecretCollector::CollectRows(TJson const& rows) {
 }
 
 void TSecretCollector::CollectInstance(TJson& instance, std::size_t at) {
-  auto const& classes = LineOf(instance["class"].get_ref<std::string const&>());
+  TClass const& ofInstance = ClassOf(instance["class"].get_ref<std::string const&>());
   TJson& properties = instance["properties"];
   for (auto& [name, property] : properties.get_ref<TJson::object_t&>()) {
     TJson const& value = property["value"];
-    if (auto const meaning = MeaningOfProperty(classes, name)) AddProperty(*meaning, property, PlaceOfProperty(at, name));
+    if (auto const meaning = MeaningOf(ofInstance, name)) AddProperty(*meaning, property, PlaceOfProperty(at, name));
     if (name == "InstanceID") ForEachString(value, [&](std::string const& text) { AddIdOfPool(text); });
     if (name == "Links") ForEachString(value, [&](std::string const& text) { AddAddressesIn(text, true); });
     if (name == "OtherIdentifyingInfo") CollectDescribed(properties, value);

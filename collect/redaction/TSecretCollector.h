@@ -7,6 +7,7 @@
 #include <nlohmann/json.hpp>
 
 #include <cstddef>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <unordered_map>
@@ -36,9 +37,15 @@ public:
   std::vector<TSecretNumber> const& Numbers() const { return fNumbers; }
 
 private:
+  struct TClass {
+    std::vector<std::string> fLine;                      // the class and its superclasses
+    std::unordered_map<std::string, EMeaning> fSecrets;  // of the properties that the plug-in marked, in lower case
+  };
+
   void ReadClasses(TJson const& classes);
-  std::vector<std::string> const& LineOf(std::string const& name);
+  TClass const& ClassOf(std::string const& name);
   void CollectRows(TJson const& rows);
+  std::optional<EMeaning> MeaningOf(TClass const& ofInstance, std::string const& property) const;
   void CollectInstance(TJson& instance, std::size_t at);
   void CollectDescribed(TJson const& properties, TJson const& values);
   void CollectShapes(std::string_view text, bool isMessage);
@@ -58,7 +65,7 @@ private:
   TSecretIndex& fIndex;
   std::vector<ESecretKind> fKinds;
   std::vector<TSecretNumber> fNumbers;
-  std::unordered_map<std::string, std::vector<std::string>> fClasses;
+  std::unordered_map<std::string, TClass> fClasses;
 };
 
 }  // namespace NQRVZEP20

@@ -44,6 +44,30 @@ TEST(TSecretCollectorTest, AClassInheritsThePropertiesOfItsSuperclasses) {
   EXPECT_THAT(Redacted(document), testing::Not(testing::HasSubstr("rack-row-9")));
 }
 
+TEST(TSecretCollectorTest, NamesAreTheSameInUpperAndLowerCase) {
+  TJson document = DocumentWith(
+      InstanceOf("x_rack", {{"serialnumber", PropertyOf("string", "ZX81-77")}, {"NAME", PropertyOf("string", "rack-row-9")}}));
+  document["classes"] = TJson::array({{{"class", "x_rack"}, {"superclasses", {"cim_system"}}}});
+  EXPECT_THAT(Redacted(document), testing::Not(testing::AnyOf(testing::HasSubstr("ZX81"), testing::HasSubstr("rack-row"))));
+}
+
+TEST(TSecretCollectorTest, APlugInMarksSecretsOfItsOwn) {
+  TJson document = DocumentWith(InstanceOf("X_Rack", {{"Contact", PropertyOf("string", "mallory")},
+                                                      {"Door", PropertyOf("string", "K-4711")},
+                                                      {"Switch", PropertyOf("string", "sw7.lab.example.net")},
+                                                      {"Colour", PropertyOf("string", "green")}}));
+  document["head"][0] = "sw7 of mallory";
+  document["classes"] = TJson::array({{{"class", "X_Rack"},
+                                       {"superclasses", TJson::array()},
+                                       {"secrets", {{"contact", "users"}, {"Door", "keys"}, {"Switch", "Hosts"}}}}});
+  std::string const text = Redacted(document);
+  EXPECT_THAT(text, testing::ContainsRegex("\"host-[0-9]+ of user-[0-9]+\""));
+  EXPECT_THAT(text, testing::Not(testing::HasSubstr("4711")));
+  EXPECT_THAT(text, testing::HasSubstr("green"));
+  document["classes"][0]["secrets"] = 3;
+  EXPECT_THROW(Redacted(document), TRedactionError);
+}
+
 TEST(TSecretCollectorTest, ADescriptionMakesIdentifyingInfoASerialNumber) {
   std::string const text = Redacted(
       DocumentWith(InstanceOf("X_Disk", {{"OtherIdentifyingInfo", PropertyOf("string[]", {"QM-0001", "QEMU DISK"})},

@@ -10,11 +10,10 @@
 #include "tools/zep/output/InstanceJson.h"
 #include "tools/zep/output/PlugInRows.h"
 #include "tools/zep/output/ReportPhrases.h"
+#include "tools/zep/output/TClassRows.h"
 
 #include <cstring>
 #include <ctime>
-#include <map>
-#include <set>
 #include <string_view>
 
 namespace NQRVZEP20::zep {
@@ -88,30 +87,14 @@ std::vector<boost::shared_ptr<ICIMInstance>> ReadableInstances(TNamespaceView co
   return instances;
 }
 
-// The superclasses of a class, the nearest first.
-std::vector<std::string> SuperclassesOf(ICIMClass const& ofClass) {
-  std::vector<std::string> names;
-  for (auto above = ofClass.GetSuperClass(TCIMContext()); above; above = above->GetSuperClass(TCIMContext()))
-    names.push_back(above->GetName(TCIMContext()));
-  return names;
-}
-
 // The classes of all instances, each once. A class that fails while it is read is left out, like its instances.
 TJson ClassesAsJson(std::vector<TPlugIn> const& plugIns) {
-  std::map<std::string, std::vector<std::string>> classes;
-  std::set<ICIMClass const*> known;
+  TClassRows rows;
   for (TNamespaceView const& view : ViewsOf(plugIns)) {
     std::string ignored;
-    for (auto const& instance : ReadableInstances(view, ignored))
-      FailureOf([&] {
-        auto const ofInstance = instance->GetClass(TCIMContext());
-        if (known.insert(ofInstance.get()).second)
-          classes.emplace(ofInstance->GetName(TCIMContext()), SuperclassesOf(*ofInstance));
-      });
+    for (auto const& instance : ReadableInstances(view, ignored)) FailureOf([&] { rows.AddClassOf(*instance); });
   }
-  TJson json = TJson::array();
-  for (auto const& [name, superclasses] : classes) json.push_back({{"class", name}, {"superclasses", superclasses}});
-  return json;
+  return rows.AsJson();
 }
 
 }  // namespace
