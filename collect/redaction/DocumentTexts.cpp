@@ -13,14 +13,22 @@ namespace {
 using TJson = nlohmann::ordered_json;
 
 // Members whose texts zep or a class defines.
-constexpr std::string_view kNames[] = {"class", "classes",  "code",      "columns", "document",     "id",         "key",
-                                       "label", "name",     "namespace", "outcome", "provider",     "question",   "redaction",
-                                       "rule",  "severity", "stage",     "status",  "superclasses", "thresholds", "time",
-                                       "title", "type",     "unit",      "worst",   "zep"};
+constexpr std::string_view kNames[] = {"class",      "classes", "columns",   "document", "id",       "key",
+                                       "label",      "name",    "namespace", "outcome",  "provider", "question",
+                                       "redaction",  "rule",    "severity",  "stage",    "status",   "superclasses",
+                                       "thresholds", "time",    "title",     "type",     "worst",    "zep"};
+
+// Whether the text has the form of the codes that zep defines: "not-given". A plug-in may give any text.
+bool IsCode(TJson const& value) {
+  if (!value.is_string()) return false;
+  auto const& text = value.get_ref<std::string const&>();
+  return std::all_of(text.begin(), text.end(), [](char byte) { return byte == '-' || (byte >= 'a' && byte <= 'z'); });
+}
 
 bool IsName(std::string_view member, TJson const& value, TPlace const& place) {
   if (member == "redaction" && place.AsText().empty()) return true;
   if (member == "thresholds" && place.AsText() == "/findings") return true;
+  if (member == "code") return IsCode(value);
   return (value.is_string() || value.is_array()) && std::binary_search(std::begin(kNames), std::end(kNames), member);
 }
 

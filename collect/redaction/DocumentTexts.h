@@ -30,8 +30,8 @@ std::string PlaceOfProperty(std::size_t instance, std::string_view name);
 bool IsNumber(nlohmann::ordered_json const& object);
 
 // Replaces each text of the document of a report by the one that `use` returns for it, if it returns one. Names that zep and the
-// classes define are omitted: titles, codes, types, classes, namespaces; of an object path, the namespace and the class. So are
-// texts of numbers and times.
+// classes define are omitted: titles, codes of zep, types, classes, namespaces; of an object path, the namespace and the class.
+// So are texts of numbers and times.
 using TUseText = std::function<std::optional<std::string>(std::string_view text, TPlace const& place)>;
 void RewriteTexts(nlohmann::ordered_json& document, TUseText const& use);
 

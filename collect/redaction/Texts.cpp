@@ -58,7 +58,7 @@ void AddParts(std::string_view text, std::size_t begin, std::size_t end, bool wi
     addresses.emplace_back(second);
   }
   for (std::size_t at = begin; withIPv4 && at < end;) {
-    std::size_t const partEnd = std::min(text.find_first_of(":-", at), end);
+    std::size_t const partEnd = std::min(text.substr(0, end).find_first_of(":-", at), end);
     std::string_view const part = WithoutMarks(text.substr(at, partEnd - at));
     if (IsIPv4(part) && IsWordBound(text, at, partEnd)) addresses.emplace_back(part);
     at = partEnd + 1;

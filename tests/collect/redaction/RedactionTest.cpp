@@ -63,6 +63,21 @@ TEST(RedactionTest, NamesOfClassesAndNamespacesRemain) {
   EXPECT_THAT(text, testing::HasSubstr("root/x:X_Thing.Tag"));
 }
 
+TEST(RedactionTest, ACodeAndAUnitOfAPlugInAreTexts) {
+  TJson document = DocumentWith("SerialNumber", "ZX81-77");
+  TJson property = PropertyOf("uint32", nullptr);
+  property["code"] = "no-ZX81-77";
+  property["unit"] = "per ZX81-77";
+  document["instances"].push_back(InstanceOf("X_Other", {{"Size", property}}));
+  TJson redacted = document;
+  TPseudonyms pseudonyms("1");
+  Redact(redacted, AllKinds(), pseudonyms);
+  EXPECT_THAT(redacted.dump(), testing::Not(testing::HasSubstr("ZX81")));
+  Unredact(redacted, pseudonyms);
+  EXPECT_EQ(redacted, document);
+  EXPECT_THAT(Redacted(DocumentWith("SystemName", "needs-root")), testing::HasSubstr("\"code\":\"needs-root\""));
+}
+
 TEST(RedactionTest, NumbersAndTimesRemain) {
   TJson const document = DocumentWith(
       InstanceOf("X_Thing", {{"SerialNumber", PropertyOf("string", "123987")}, {"Size", PropertyOf("uint64", "123987")}}));
