@@ -1,14 +1,13 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/stored/Differences.h"
 
-#include "MissingValueClass.h"
 #include "collect/stored/ObjectName.h"
+#include "collect/stored/TExamined.h"
 
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
-#include <map>
-#include <set>
+#include <iterator>
 #include <string_view>
 
 namespace NQRVZEP20 {
@@ -16,49 +15,72 @@ namespace NQRVZEP20 {
 namespace {
 
 using EKind = TObjectDifference::EKind;
-using TInstances = std::map<std::string, TStoredInstance const*>;
 
 // ---- What always changes ----
 
 bool Contains(std::string_view text, std::string_view part) { return text.find(part) != text.npos; }
 
-// Properties of any class that change on a machine with which nothing has happened.
+// Properties that change on a machine with which nothing has happened; those in the first column of any class.
+struct TVolatile {
+  std::string_view fClass, fProperty;
+};
+constexpr TVolatile kVolatile[] = {{"", "AvailableMemory"},
+                                   {"", "AvailableSpace"},
+                                   {"", "ClockTime"},
+                                   {"", "CurrentClockSpeed"},
+                                   {"", "FreeInodes"},
+                                   {"", "FreeMemory"},
+                                   {"", "FreePhysicalMemory"},
+                                   {"", "FreeSpace"},
+                                   {"", "FreeSpaceInPagingFiles"},
+                                   {"", "FreeSwap"},
+                                   {"", "FreeVirtualMemory"},
+                                   {"", "LoadOfFifteenMinutes"},
+                                   {"", "LoadOfFiveMinutes"},
+                                   {"", "LoadOfOneMinute"},
+                                   {"", "LoadPercentage"},
+                                   {"", "LocalDateTime"},
+                                   {"", "NumberOfFiles"},
+                                   {"", "NumberOfProcesses"},
+                                   {"", "NumberOfUsers"},
+                                   {"", "PowerOnHours"},
+                                   {"", "PreferredLifetime"},
+                                   {"", "TotalPowerOnHours"},
+                                   {"", "Uptime"},
+                                   {"", "ValidLifetime"},
+                                   {"ZEP_DiskHealth", "BytesRead"},
+                                   {"ZEP_DiskHealth", "BytesWritten"},
+                                   {"ZEP_KernelLog", "CurrentNumberOfRecords"},
+                                   {"ZEP_KernelLog", "GoneRecords"},
+                                   {"ZEP_RaidArray", "Progress"},
+                                   {"ZEP_SmartAttribute", "RawText"},
+                                   {"ZEP_SmartAttribute", "RawValue"},
+                                   {"ZEP_SwapArea", "Used"}};
+
 bool IsVolatile(std::string const& cls, std::string const& property) {
-  static std::set<std::string_view> const names = {"AvailableMemory",
-                                                   "AvailableSpace",
-                                                   "FreeInodes",
-                                                   "FreeMemory",
-                                                   "FreePhysicalMemory",
-                                                   "FreeSpace",
-                                                   "FreeSwap",
-                                                   "FreeVirtualMemory",
-                                                   "LoadOfFifteenMinutes",
-                                                   "LoadOfFiveMinutes",
-                                                   "LoadOfOneMinute",
-                                                   "LoadPercentage",
-                                                   "LocalDateTime",
-                                                   "NumberOfFiles",
-                                                   "NumberOfProcesses",
-                                                   "NumberOfUsers",
-                                                   "PowerOnHours",
-                                                   "TotalPowerOnHours",
-                                                   "Uptime",
-                                                   "ClockTime",
-                                                   "CurrentClockSpeed",
-                                                   "SizeStoredInPagingFiles",
-                                                   "FreeSpaceInPagingFiles"};
   bool const isTraffic = Contains(cls, "Statistics") && !Contains(property, "Error") && !Contains(property, "Failure");
-  return names.count(property) > 0 || isTraffic;
+  return isTraffic || std::any_of(std::begin(kVolatile), std::end(kVolatile), [&](TVolatile const& row) {
+           return row.fProperty == property && (row.fClass.empty() || row.fClass == cls);
+         });
 }
 
-// Whether the reading of a sensor moved less than makes it another one.
-bool IsWithinHysteresis(TStoredInstance const& instance, TStoredProperty const& before, TStoredProperty const& after) {
+bool IsReading(std::string const& cls, std::string const& property) {
+  return property == "CurrentReading" || (cls == "ZEP_DiskHealth" && property == "Temperature") ||
+         (cls == "ZEP_SmartAttribute" && property == "Value");
+}
+
+double NumberIn(TStoredProperty const* property) {
+  return property != nullptr && property->IsKnown() ? std::strtod(property->fRaw.c_str(), nullptr) : 0;
+}
+
+// Whether the reading of a sensor moved less than makes it another one, in either direction.
+bool IsWithinHysteresis(TStoredInstance const& before, TStoredInstance const& after, std::string const& name) {
   constexpr double usual = 0.1;  // of the reading
-  if (before.fName != "CurrentReading" || !before.IsKnown() || !after.IsKnown()) return false;
-  double const one = std::strtod(before.fRaw.c_str(), nullptr), other = std::strtod(after.fRaw.c_str(), nullptr);
-  TStoredProperty const* const hysteresis = instance.Find("Hysteresis");
-  bool const hasIts = hysteresis != nullptr && hysteresis->IsKnown();
-  return std::abs(one - other) <= (hasIts ? std::strtod(hysteresis->fRaw.c_str(), nullptr) : usual * std::abs(one));
+  TStoredProperty const *const one = before.Find(name), *const other = after.Find(name);
+  if (!IsReading(before.fClass, name) || !one->IsKnown() || !other->IsKnown()) return false;
+  double const hysteresis = std::max(NumberIn(before.Find("Hysteresis")), NumberIn(after.Find("Hysteresis")));
+  double const largest = std::max(std::abs(NumberIn(one)), std::abs(NumberIn(other)));
+  return std::abs(NumberIn(one) - NumberIn(other)) <= (hysteresis > 0 ? hysteresis : usual * largest);
 }
 
 // ---- Values ----
@@ -82,68 +104,42 @@ std::vector<TChange> ChangesOf(TStoredInstance const& before, TStoredInstance co
   for (TStoredProperty const& property : before.fProperties) {
     TStoredProperty const* const other = after.Find(property.fName);
     if (other == nullptr || IsSame(property, *other) || IsVolatile(before.fClass, property.fName)) continue;
-    if (!IsWithinHysteresis(before, property, *other)) changes.push_back(ChangeOf(property, *other));
+    if (!IsWithinHysteresis(before, after, property.fName)) changes.push_back(ChangeOf(property, *other));
   }
   return changes;
 }
 
 // ---- Objects ----
 
-// The providers that failed, with the reason.
-std::map<std::string, std::string> FailuresIn(TStoredReport const& report) {
-  std::map<std::string, std::string> failures;
-  for (TStoredProvider const& provider : report.fProviders)
-    if (!provider.fError.empty()) failures[provider.fName.empty() ? provider.fPlugIn : provider.fName] = provider.fError;
-  return failures;
-}
+bool IsCompared(TStoredInstance const& instance) { return !instance.IsAssociation(); }
 
-std::set<std::string> ProvidersIn(TStoredReport const& report) {
-  std::set<std::string> names;
-  for (TStoredInstance const& instance : report.fInstances) names.insert(instance.fProvider);
-  return names;
-}
-
-// The providers whose objects `other` cannot have, because they failed there or do not exist, and why.
-std::map<std::string, std::string> Incomparable(TStoredReport const& report, TStoredReport const& other) {
-  std::map<std::string, std::string> reasons;
-  for (auto const& [name, failure] : FailuresIn(other))
-    reasons[name] = "provider " + name + " failed in " + other.fFile + ": " + failure;
-  for (std::string const& name : ProvidersIn(report)) {
-    bool const exists = std::any_of(other.fProviders.begin(), other.fProviders.end(),
-                                    [&](TStoredProvider const& provider) { return provider.fName == name; });
-    if (!exists) reasons.emplace(name, "provider " + name + " does not exist in " + other.fFile);
-  }
-  return reasons;
-}
-
-TInstances ComparedIn(TStoredReport const& report, std::map<std::string, std::string> const& incomparable) {
-  TInstances instances;
-  for (TStoredInstance const& instance : report.fInstances)
-    if (instance.fClass != kMissingValueClass && !instance.IsAssociation() && incomparable.count(instance.fProvider) == 0)
-      instances.emplace(instance.fPath, &instance);
-  return instances;
+void AddOnce(std::string const& reason, std::vector<std::string>& reasons) {
+  if (std::find(reasons.begin(), reasons.end(), reason) == reasons.end()) reasons.push_back(reason);
 }
 
 TObjectDifference DifferenceOf(EKind kind, TStoredInstance const& instance, std::vector<TChange> changes = {}) {
   return {kind, instance.fClass, instance.fPath, ObjectName(instance), std::move(changes)};
 }
 
-// The objects of `some` that `others` lacks.
-void AddMissing(EKind kind, TInstances const& some, TInstances const& others, std::vector<TObjectDifference>& differences) {
-  for (auto const& [path, instance] : some)
-    if (others.count(path) == 0) differences.push_back(DifferenceOf(kind, *instance));
+// Adds the objects of `some` that `others` lacks, or why it may lack them.
+void AddMissing(EKind kind, TExamined const& some, TExamined const& others, TDifferences& differences) {
+  for (auto const& [key, instance] : some.Instances()) {
+    if (!IsCompared(*instance) || others.Instances().count(key) > 0) continue;
+    std::string const why = others.WhyUnknown(*instance);
+    if (why.empty())
+      differences.fObjects.push_back(DifferenceOf(kind, *instance));
+    else
+      AddOnce(why, differences.fNotCompared);
+  }
 }
 
-std::vector<TObjectDifference> ObjectsOf(TInstances const& before, TInstances const& after) {
-  std::vector<TObjectDifference> differences;
-  AddMissing(EKind::kGone, before, after, differences);
-  AddMissing(EKind::kAppeared, after, before, differences);
-  for (auto const& [path, instance] : before) {
-    auto const other = after.find(path);
-    auto changes = other == after.end() ? std::vector<TChange>() : ChangesOf(*instance, *other->second);
-    if (!changes.empty()) differences.push_back(DifferenceOf(EKind::kChanged, *other->second, std::move(changes)));
+void AddChanged(TExamined const& before, TExamined const& after, TDifferences& differences) {
+  for (auto const& [key, instance] : before.Instances()) {
+    auto const other = after.Instances().find(key);
+    if (other == after.Instances().end() || !IsCompared(*instance)) continue;
+    if (auto changes = ChangesOf(*instance, *other->second); !changes.empty())
+      differences.fObjects.push_back(DifferenceOf(EKind::kChanged, *other->second, std::move(changes)));
   }
-  return differences;
 }
 
 // ---- Rows and problems ----
@@ -162,14 +158,24 @@ void AddRows(std::vector<TStoredRow> const& before, std::vector<TStoredRow> cons
       if (row.fKey == other.fKey && !IsSame(row.fAnswer, other.fAnswer)) changes.push_back({row.fLabel, text(row), text(other)});
 }
 
-// The problems of `some` that `others` lacks. The reason may contain a figure that changes, so it does not count.
-std::vector<TStoredProblem> ProblemsWithout(std::vector<TStoredProblem> const& some, std::vector<TStoredProblem> const& others) {
+// The reason may contain a figure that changes, so it does not count.
+bool IsSame(TStoredProblem const& one, TStoredProblem const& other) {
+  return one.fRule == other.fRule && one.fInstance == other.fInstance && one.fSeverity == other.fSeverity;
+}
+
+// The problems of `some` that are not among `others`, which are those of `examined`. Adds why others could not be found there.
+std::vector<TStoredProblem> ProblemsWithout(std::vector<TStoredProblem> const& some, TExamined const& its,
+                                            std::vector<TStoredProblem> const& others, TExamined const& examined,
+                                            std::vector<std::string>& notCompared) {
   std::vector<TStoredProblem> problems;
   for (TStoredProblem const& problem : some) {
-    bool const isThere = std::any_of(others.begin(), others.end(), [&](TStoredProblem const& other) {
-      return other.fRule == problem.fRule && other.fInstance == problem.fInstance && other.fSeverity == problem.fSeverity;
-    });
-    if (!isThere) problems.push_back(problem);
+    auto const isIt = [&](TStoredProblem const& other) { return IsSame(problem, other); };
+    if (std::any_of(others.begin(), others.end(), isIt)) continue;
+    std::string const why = examined.WhyUnknown(problem, its.Find(problem.fInstance));
+    if (why.empty())
+      problems.push_back(problem);
+    else
+      AddOnce("problem \"" + problem.fReason + "\": " + why, notCompared);
   }
   return problems;
 }
@@ -184,14 +190,17 @@ std::string NameOf(TObjectDifference::EKind kind) {
 
 TDifferences DifferencesOf(TStoredReport const& before, TStoredReport const& after) {
   TDifferences differences;
-  auto incomparable = Incomparable(before, after);
-  incomparable.merge(Incomparable(after, before));
-  for (auto const& [provider, reason] : incomparable) differences.fNotCompared.push_back(reason);
-  differences.fObjects = ObjectsOf(ComparedIn(before, incomparable), ComparedIn(after, incomparable));
+  auto& notCompared = differences.fNotCompared;
+  TExamined const earlier(before), later(after);
+  for (TExamined const* const examined : {&earlier, &later})
+    for (auto const& [provider, failure] : examined->Failures()) AddOnce(failure, notCompared);
+  AddMissing(EKind::kGone, earlier, later, differences);
+  AddMissing(EKind::kAppeared, later, earlier, differences);
+  AddChanged(earlier, later, differences);
   AddRows(before.fIdentity, after.fIdentity, differences.fRows);
   AddRows(before.fDetails, after.fDetails, differences.fRows);
-  differences.fNewProblems = ProblemsWithout(after.fProblems, before.fProblems);
-  differences.fSolvedProblems = ProblemsWithout(before.fProblems, after.fProblems);
+  differences.fNewProblems = ProblemsWithout(after.fProblems, later, before.fProblems, earlier, notCompared);
+  differences.fSolvedProblems = ProblemsWithout(before.fProblems, earlier, after.fProblems, later, notCompared);
   return differences;
 }
 

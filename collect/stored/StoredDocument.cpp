@@ -15,29 +15,6 @@ namespace {
 
 using TJson = TStoredDocument;
 
-// Refuses what no report contains, before it costs memory or time: the library searches the members of an object one by one.
-class TBounds {
-public:
-  bool Check(int depth, TJson::parse_event_t event) {
-    constexpr int deepest = 16;
-    constexpr std::size_t mostMembers = 2000;
-    if (depth >= deepest) throw TStoredReportError("the document is nested too deeply");
-    std::size_t& members = fMembers[depth];
-    if (event == TJson::parse_event_t::object_start) fMembers[depth + 1] = 0;
-    if (event == TJson::parse_event_t::key && ++members > mostMembers)
-      throw TStoredReportError("an object has more than " + std::to_string(mostMembers) + " members");
-    return true;
-  }
-
-private:
-  std::size_t fMembers[32] = {};
-};
-
-TJson BoundedJson(std::string_view text) {
-  TBounds bounds;
-  return TJson::parse(text, [&](int depth, TJson::parse_event_t event, TJson&) { return bounds.Check(depth, event); });
-}
-
 // "line 3, column 9: syntax error while parsing value - unexpected end of input": the message without the number of the exception
 // and without the text of the file, which may be a password.
 std::string WhyNotJson(TJson::exception const& failure) {
@@ -59,7 +36,7 @@ TJson Parsed(std::string const& text) {
   constexpr std::string_view gzip = "\x1f\x8b";
   if (text.compare(0, gzip.size(), gzip) == 0) throw TStoredReportError("it is compressed; gunzip it first");
   try {
-    return BoundedJson(text);
+    return BoundedJson(text, kDocumentBounds);
   } catch (TJson::exception const& failure) {
     throw TStoredReportError(IsLines(text) ? kLines : WhyNotJson(failure));
   }
@@ -107,9 +84,9 @@ auto WithName(std::string const& name, TRead read) {
 
 }  // namespace
 
-TStoredDocument ParsedWithinBounds(std::string_view text) {
+TStoredDocument ParsedWithinBounds(std::string_view text, TJsonBounds const& bounds) {
   try {
-    return BoundedJson(text);
+    return BoundedJson(text, bounds);
   } catch (TJson::exception const& failure) {
     throw TStoredReportError(WhyNotJson(failure));
   }

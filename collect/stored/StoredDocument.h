@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "collect/stored/BoundedJson.h"
 #include "collect/stored/StoredReport.h"
 
 #include <nlohmann/json.hpp>
@@ -16,9 +17,11 @@ using TStoredDocument = nlohmann::ordered_json;
 // The version of the documents that this library reads.
 constexpr int kStoredVersion = 2;
 
-// Parses a JSON document. Throws TStoredReportError if it is none, or has objects with more members, or deeper nested ones, than
-// the documents of zep, which would take memory or time.
-TStoredDocument ParsedWithinBounds(std::string_view text);
+// Those of the documents of zep. Values of that number take half a gigabyte at most.
+constexpr TJsonBounds kDocumentBounds{16, 2000, 8000000};
+
+// Parses a JSON document. Throws TStoredReportError if it is none, or beyond the bounds.
+TStoredDocument ParsedWithinBounds(std::string_view text, TJsonBounds const& bounds = kDocumentBounds);
 
 // Parses a document and checks that it is one of a report, in that version; its parts are checked by StoredReportOf. Throws
 // TStoredReportError.

@@ -65,7 +65,9 @@ TStoredProblem ProblemOf(TStoredNode const& node) {
 TStoredRule RuleOf(TStoredNode const& node) {
   std::string const outcome = WordOf(node, "outcome", {"fine", "wrong", "not-asked"});
   return {node.TextOf("id"), node.TextOf("question"), outcome, outcome == "fine" && node.Member("examined").Number() == 0,
-          node.Member("notExamined").Elements([](TStoredNode const& element) { return element.TextOf("reason"); })};
+          node.Member("notExamined").Elements([](TStoredNode const& element) {
+            return TStoredNotExamined{element.TextOrNullOf("instance"), element.TextOf("reason")};
+          })};
 }
 
 void AddProviders(TStoredNode const& plugIn, std::vector<TStoredProvider>& providers) {
@@ -131,9 +133,9 @@ TStoredProperty PropertyOf(TStoredNode const& node) {
 
 TStoredInstance InstanceOf(TStoredNode const& node) {
   TStoredInstance instance{node.TextOf("path"), node.TextOf("provider"), node.TextOf("namespace"), node.TextOf("class"), {}};
-  node.Member("properties").ForEachMember([&](TStoredNode const& property) {
-    instance.fProperties.push_back(PropertyOf(property));
-  });
+  TStoredNode const properties = node.Member("properties");
+  instance.fProperties.reserve(properties.Json().size());
+  properties.ForEachMember([&](TStoredNode const& property) { instance.fProperties.push_back(PropertyOf(property)); });
   return instance;
 }
 

@@ -52,10 +52,15 @@ struct TStoredProblem {
   std::string fRule, fSeverity, fReason, fRemedy, fInstance;  // remedy and instance may be empty
 };
 
+struct TStoredNotExamined {
+  std::string fInstance;  // empty: all of a kind
+  std::string fReason;
+};
+
 struct TStoredRule {
-  std::string fId, fQuestion, fOutcome;   // "fine", "wrong" or "not-asked"
-  bool fHasNothingToExamine;              // the outcome is "fine", and no value was examined
-  std::vector<std::string> fNotExamined;  // the reasons
+  std::string fId, fQuestion, fOutcome;  // "fine", "wrong" or "not-asked"
+  bool fHasNothingToExamine;             // the outcome is "fine", and no value was examined
+  std::vector<TStoredNotExamined> fNotExamined;
 };
 
 struct TStoredProvider {

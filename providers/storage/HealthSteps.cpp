@@ -27,7 +27,7 @@ void WriteHealth(TStorage& storage) {
   }
   TMissing const noReport{storage.fDisks.empty() ? kMissingNotGiven : kMissingNoSource,
                           "no disk has a report of its health: the property HealthState of each disk has the reason"};
-  TMissing const noAttributes{kMissingNotGiven, "no disk has a table of SMART attributes that smartctl could read"};
+  TMissing const noAttributes{kMissingNoSource, "no disk has a table of SMART attributes that smartctl could read"};
   storage.fWriter.Write(HealthRecord("", NoSmartReport(noReport)), records, noReport);
   storage.fWriter.Write(AttributeRecord("", TSmartAttribute()), attributes, noAttributes);
   for (auto const& [name, record] : ofDrives) storage.fWriter.Associate(kStatistics, storage.fDrives.at(name), record);

@@ -6,6 +6,8 @@
 
 #include <sys/stat.h>
 
+#include <ctime>
+
 namespace NQRVZEP20 {
 namespace {
 
@@ -35,7 +37,7 @@ TEST(StoredReportTest, HasTheHeadTheRowsAndTheFindings) {
   EXPECT_EQ(report.fIdentity.at(1).fAnswer.fMissing.fReason, "needs root");
   EXPECT_EQ(*report.fDetails.at(0).fAnswer.fValue, "16 GiB");
   EXPECT_EQ(report.fProblems.at(0).fReason, "the disk sda is failing");
-  EXPECT_EQ(report.fRules.at(0).fNotExamined.at(0), "needs root");
+  EXPECT_EQ(report.fRules.at(0).fNotExamined.at(0).fReason, "needs root");
 }
 
 TEST(StoredReportTest, HasTheTablesAndTheProviders) {
@@ -147,6 +149,23 @@ TEST(StoredReportTest, DeepAndWideDocumentsAreRefusedWithoutCost) {
   std::string wide = "{";
   for (int at = 0; at < 100000; ++at) wide += "\"" + std::to_string(at) + "\":0,";
   EXPECT_EQ(WhyTextRefused(wide + "\"x\":0}"), "a.json: an object has more than 2000 members");
+  std::string many = "[0";
+  for (int at = 0; at < 8000000; ++at) many += ",0";
+  std::string object = "{\"x\":0";
+  for (int at = 0; at < 1900; ++at) object += ",\"" + std::to_string(at) + "\":0";
+  std::string wideObjects = "[0";
+  for (int at = 0; at < 200; ++at) wideObjects += "," + object + "}";
+  EXPECT_EQ(WhyTextRefused(wideObjects + "]"), "a.json: too many of its objects have many members");
+  EXPECT_EQ(WhyTextRefused(many + "]"), "a.json: it has more than 8000000 values");
+}
+
+// Ten times the elements may not take a hundred times the time.
+TEST(StoredReportTest, ALongArrayTakesTimeInProportionToItsLength) {
+  std::string text = "{\"document\": \"zep report\", \"version\": 2, \"instances\": [{}";
+  for (int at = 0; at < 160000; ++at) text += ",{\"a\":0}";
+  std::clock_t const start = std::clock();
+  EXPECT_EQ(WhyTextRefused(text + "]}"), "a.json: the document has no member \"reason\"");
+  EXPECT_LT(double(std::clock() - start) / CLOCKS_PER_SEC, 2);
 }
 
 TEST(StoredReportTest, AFileThatIsNotAReportIsRefusedByItsName) {

@@ -8,6 +8,7 @@
 #include <CLI/CLI.hpp>
 
 #include <memory>
+#include <utility>
 
 namespace NQRVZEP20::zep {
 
@@ -25,8 +26,8 @@ TRun AddDiffArguments(CLI::App& command) {
       "Exit status: 0 when the reports are the same, 1 when they differ, 2 when they are the same as far as they could be\n"
       "compared, 64 for wrong usage, 66 when a file cannot be read or is not a report, 73 when the page cannot be written.");
   return [arguments] {
-    TStoredReport const before = ReadReport(arguments->fBefore);
-    return PrintDifferences("zep diff", before, ReadReport(arguments->fAfter), arguments->fOutput);
+    TStoredReport before = ReadReport(arguments->fBefore);
+    return PrintDifferences("zep diff", std::move(before), ReadReport(arguments->fAfter), arguments->fOutput);
   };
 }
 

@@ -60,11 +60,19 @@ void CheckPseudonyms(TStoredReport const& before, TStoredReport const& after) {
                      "; redact both alike, or give the originals back with zep unredact");
 }
 
+// The names of files may contain what is redacted in them, such as the names of the host and the user.
+void HideFiles(TStoredReport& before, TStoredReport& after) {
+  if (before.fRedaction.empty()) return;
+  before.fFile = "the earlier report";
+  after.fFile = "the later report";
+}
+
 }  // namespace
 
-EExitStatus PrintDifferences(std::string const& document, TStoredReport const& before, TStoredReport const& after,
+EExitStatus PrintDifferences(std::string const& document, TStoredReport before, TStoredReport after,
                              TDifferenceOutput const& output) {
   CheckPseudonyms(before, after);
+  HideFiles(before, after);
   TDifferences const differences = DifferencesOf(before, after);
   EExitStatus const status = !differences.IsSame()              ? kExitNothing
                              : differences.fNotCompared.empty() ? kExitComplete

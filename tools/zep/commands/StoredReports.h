@@ -33,8 +33,9 @@ struct TDifferenceOutput {
 
 // Prints the differences of two reports as text or as a document named `document`, or writes them as a page. Returns
 // kExitComplete if there are none, kExitNothing if there are some, and kExitPartial if there are none but not everything could be
-// compared. Throws TFailure with kExitNoInput if the reports are not redacted alike.
-EExitStatus PrintDifferences(std::string const& document, TStoredReport const& before, TStoredReport const& after,
+// compared. The output does not name the files of redacted reports. Throws TFailure with kExitNoInput if the reports are not
+// redacted alike.
+EExitStatus PrintDifferences(std::string const& document, TStoredReport before, TStoredReport after,
                              TDifferenceOutput const& output);
 
 }  // namespace NQRVZEP20::zep

@@ -82,7 +82,7 @@ std::string Answer(TStoredRule const& rule) {
   if (rule.fOutcome == "fine") return Element("span", "class=\"fine\"", "no");
   if (rule.fOutcome == "wrong") return Element("span", "class=\"error\"", "yes");
   if (rule.fNotExamined.empty()) return Element("span", "class=\"none\"", "unknown");
-  return Missing({"", rule.fNotExamined.front()});
+  return Missing({"", rule.fNotExamined.front().fReason});
 }
 
 std::string Rules(TStoredReport const& report) {
@@ -90,7 +90,8 @@ std::string Rules(TStoredReport const& report) {
   for (TStoredRule const& rule : report.fRules) rows += RowWith({Html(rule.fQuestion), Answer(rule)});
   std::size_t const notAsked = RulesNotAsked(report),
                     idle = CountRules(report, [](TStoredRule const&rule) { return rule.fHasNothingToExamine; });
-  std::string const summary = std::to_string(report.fRules.size() - notAsked - idle) + " rules asked, " + std::to_string(idle) +
+  std::size_t const asked = report.fRules.size() - notAsked - idle;
+  std::string const summary = std::to_string(asked) + (asked == 1 ? " rule asked, " : " rules asked, ") + std::to_string(idle) +
                               " had nothing to examine, " + std::to_string(notAsked) + " could not be asked";
   return "<details>" + Element("summary", summary) + Table("Rules", {"Question", "Answer"}, rows) + "</details>\n";
 }

@@ -70,7 +70,7 @@ std::vector<std::string> ReasonsOf(TFindings const& findings) {
 
 std::string OutcomeText(TStoredRule const& rule) {
   if (rule.fHasNothingToExamine) return "nothing to examine";
-  std::string const reason = rule.fNotExamined.empty() ? "" : ": " + rule.fNotExamined.front();
+  std::string const reason = rule.fNotExamined.empty() ? "" : ": " + rule.fNotExamined.front().fReason;
   if (rule.fOutcome == "not-asked") return "not asked" + reason;
   if (rule.fOutcome == "wrong" || reason.empty()) return rule.fOutcome;
   return "fine, but " + std::to_string(rule.fNotExamined.size()) + " not examined" + reason;
@@ -108,7 +108,7 @@ std::string RulesAsText(TFindings const& findings, std::string const& label) {
   std::vector<TStoredRule> rules;
   for (TRuleResult const& rule : findings.fRules) {
     rules.push_back({rule.fId, rule.fTitle, NameOf(rule.fOutcome), rule.HasNothingToExamine(), {}});
-    for (auto const& notAsked : rule.fNotAsked) rules.back().fNotExamined.push_back(notAsked.fReason);
+    for (auto const& notAsked : rule.fNotAsked) rules.back().fNotExamined.push_back({notAsked.fInstance, notAsked.fReason});
   }
   return RulesAsText(rules, label);
 }

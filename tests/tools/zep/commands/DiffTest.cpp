@@ -52,6 +52,18 @@ TEST_F(DiffTest, TheSameMachineHasNoDifferencesLater) {
   EXPECT_EQ(run.fOutput, "no differences\n");
 }
 
+// The name of a file may contain a secret.
+TEST_F(DiffTest, AComparisonOfRedactedReportsDoesNotNameTheirFiles) {
+  std::string const redacted = "\"redaction\": {\"map\": \"0123456789abcdef\", \"kinds\": [\"hosts\"]}, \"status\"";
+  Write("db1-a.json", WithReplaced(StoredDocument(), "\"status\"", redacted));
+  Write("db1-b.json", WithReplaced(HealthyDocument(), "\"status\"", redacted));
+  TRun const run = Run({"diff", "db1-a.json", "db1-b.json", "--json", "--html", "page.html"});
+  EXPECT_EQ(run.fStatus, 2) << run.fErrors;
+  EXPECT_THAT(run.fOutput, HasSubstr("provider Disks failed in the earlier report: no disk"));
+  EXPECT_THAT(run.fOutput, HasSubstr("\"file\": \"the later report\""));
+  EXPECT_THAT(run.fOutput + ReadFile(fZep.Path("page.html")), testing::Not(HasSubstr("db1-")));
+}
+
 TEST_F(DiffTest, AnUnreadableReportIsRefusedByNameAndPlace) {
   TRun const cut = Run({"diff", "a.json", "cut.json"});
   EXPECT_EQ(cut.fStatus, 66);

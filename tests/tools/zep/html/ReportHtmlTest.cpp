@@ -65,7 +65,7 @@ TEST(ReportHtmlTest, WithoutProblemsTheRulesThatWereNotAskedAreMentioned) {
 
 TEST(ReportHtmlTest, RulesWithNothingToExamineAreCountedApart) {
   std::string const wrong = R"("outcome": "wrong", "examined": 1)";
-  EXPECT_THAT(PageOf(StoredDocument()), HasSubstr("1 rules asked, 0 had nothing to examine, 0 could not be asked"));
+  EXPECT_THAT(PageOf(StoredDocument()), HasSubstr("1 rule asked, 0 had nothing to examine, 0 could not be asked"));
   std::string const idle = PageOf(StoredDocumentWith(wrong, R"("outcome": "fine", "examined": 0)"));
   EXPECT_THAT(idle, HasSubstr("0 rules asked, 1 had nothing to examine, 0 could not be asked"));
   EXPECT_THAT(idle, HasSubstr("nothing to examine</span>"));
