@@ -39,13 +39,19 @@ std::deque<std::string> NamesOf(std::string const& path) {
   return names;
 }
 
-// The target of a link below the root, relative to the directory of the link. With it, the copy can be read without regard to
-// its root.
+// The target of a link below the root, relative to the directory of the link, which is not reached through links, and without
+// the ".." beyond the root, which is its own parent. With it, the copy can be read without regard to its root.
 std::string RelativeTarget(std::string const& link, std::string const& target) {
-  if (target.empty() || target.front() != '/') return target;
-  std::string up;
-  for (auto depth = std::count(link.begin(), link.end(), '/'); depth > 1; --depth) up += "../";
-  return up + fs::path(target).relative_path().string();
+  auto const depth = std::count(link.begin(), link.end(), '/') - 1;
+  bool const isAbsolute = !target.empty() && target.front() == '/';
+  std::deque<std::string> names = NamesOf(target);
+  auto const ups = std::find_if(names.begin(), names.end(), [](std::string const& name) { return name != ".."; }) - names.begin();
+  if (!isAbsolute && ups <= depth) return target;
+  names.erase(names.begin(), names.begin() + ups);
+  for (auto level = depth; level > 0; --level) names.emplace_front("..");
+  std::string relative = ".";
+  for (std::string const& name : names) relative += "/" + name;
+  return names.empty() ? relative : relative.substr(2);
 }
 
 std::string TargetOf(TFd const& link) {

@@ -124,6 +124,24 @@ TEST_F(TMachineCopyTest, TheDirectoryOfTheReadingProcessIsCopiedUnderOneName) {
   EXPECT_TRUE(fs::is_directory(fs::symlink_status(fCopy.Path("proc/self"))));
 }
 
+// The parent of the root is the root.
+TEST_F(TMachineCopyTest, ALinkThatLeadsAboveTheRootStaysWithinIt) {
+  fs::create_directories(fMachine.Path("etc"));
+  fs::create_symlink("../../../config", fMachine.Path("etc/above"));
+  fs::create_symlink("../config", fMachine.Path("etc/beside"));
+  fs::create_symlink("/../../config", fMachine.Path("etc/absolute"));
+  fs::create_symlink("../..", fMachine.Path("etc/root"));
+  TMachineFiles const files = Recording();
+  for (char const* name : {"above", "beside", "absolute", "root/config"}) {
+    EXPECT_EQ(Text(files.Content(std::string("/etc/") + name)), "0123456789") << name;
+    EXPECT_EQ(Text(Replayed().Content(std::string("/etc/") + name)), "0123456789") << name;
+  }
+  EXPECT_EQ(fs::read_symlink(fCopy.Path("etc/above")), "../config");
+  EXPECT_EQ(fs::read_symlink(fCopy.Path("etc/beside")), "../config");
+  EXPECT_EQ(fs::read_symlink(fCopy.Path("etc/absolute")), "../config");
+  EXPECT_EQ(fs::read_symlink(fCopy.Path("etc/root")), "..");
+}
+
 TEST_F(TMachineCopyTest, TheReadingLibraryIsNoted) {
   Recording();
   EXPECT_TRUE(fs::exists(fCopy.Path("zep-plug-ins/reasons_tests")));

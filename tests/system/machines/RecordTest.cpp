@@ -13,7 +13,7 @@
 namespace NQRVZEP20::zep {
 namespace {
 
-// The collector's own timing, and the paths of its installation.
+// Without the collector's own timing.
 std::string WithoutTiming(std::string const& document) {
   std::string const timed = std::regex_replace(document, std::regex("\"time\": \"[^\"]*\""), "\"time\": N");
   return std::regex_replace(timed, std::regex("\"milliseconds\": [0-9.e+-]+"), "\"milliseconds\": N");

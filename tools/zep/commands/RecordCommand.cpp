@@ -6,6 +6,7 @@
 #include "providers/reasons/RecordedMark.h"
 #include "tools/zep/commands/Commands.h"
 #include "tools/zep/commands/Providers.h"
+#include "tools/zep/commands/Thresholds.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/OutputFile.h"
@@ -54,7 +55,7 @@ TCounts CountsOf(TRecordingIndex const& index) {
 std::string ReasonOf(TRecordingIndex const& index) {
   std::string names;
   for (TNotRecorded const& row : index.fNotRecorded) names += (names.empty() ? "" : ", ") + row.fPlugIn;
-  if (!names.empty()) return "not all plug-ins were recorded: " + names;
+  if (!names.empty()) return "not everything was recorded: " + names;
   return index.fPlugIns.empty() ? "no plug-in was recorded" : "";
 }
 
@@ -93,7 +94,7 @@ EExitStatus StatusOf(TRecordingIndex const& index) {
 int Record(TArguments const& arguments) {
   TInterruptGuard const guard;
   TRecorder const recorder;
-  auto const [index, archive] = recorder.Finish(LoadPlugInsFor(arguments.fPlugIns, std::nullopt));
+  auto const [index, archive] = recorder.Finish(LoadPlugInsFor(arguments.fPlugIns, std::nullopt), ThresholdSettings());
   ThrowIfInterrupted();
   WritePrivateFile(arguments.fFile, archive);
   EExitStatus const status = StatusOf(index);

@@ -20,9 +20,11 @@
 
 #include <CLI/CLI.hpp>
 
+#include <filesystem>
 #include <iostream>
 #include <memory>
 #include <optional>
+#include <utility>
 
 namespace NQRVZEP20::zep {
 
@@ -58,17 +60,21 @@ TReport ReportHere(std::optional<TSample> const& sample, TReportArguments const&
 
 // Both reports are redacted with the same map, so that they differ only where their originals do.
 int ReportSince(TReportArguments const& arguments) {
-  TStoredReport const before = ReadReport(arguments.fSince, arguments.fRedaction);
+  TStoredReport before = ReadReport(arguments.fSince, arguments.fRedaction);
   auto const sample = SampleIf(arguments.fSample);
-  TStoredReport const now = TMadeReport(ReportHere(sample, arguments), arguments.fRedaction).Stored();
-  return PrintDifferences("zep report --since", before, now, {arguments.fAsJson, arguments.fHtmlFile});
+  TStoredReport now = TMadeReport(ReportHere(sample, arguments), arguments.fRedaction).Stored();
+  return PrintDifferences("zep report --since", std::move(before), std::move(now), {arguments.fAsJson, arguments.fHtmlFile});
 }
 
 // The report on the machine that `replay` makes the plug-ins read.
 TReport ReportOn(TReplay const& replay, TReportArguments const& arguments) {
   auto const files = replay.Choose(FindPlugInsFor(arguments.fPlugIns));
-  TReport report = MakeReport(LoadPlugInsFor(arguments.fPlugIns, std::nullopt, files), std::nullopt, {ThresholdSettings()});
-  report.fRecorded = replay.Index().fTime;
+  TRecordingIndex const& index = replay.Index();
+  TReport report = MakeReport(LoadPlugInsFor(arguments.fPlugIns, std::nullopt, files), std::nullopt, {index.fThresholds});
+  report.fRecorded = index.fTime;
+  if (!index.fPlugInDirectory.empty())
+    for (TPlugIn& plugIn : report.fPlugIns)
+      plugIn.fFile = index.fPlugInDirectory + "/" + std::filesystem::path(plugIn.fFile).filename().string();
   return report;
 }
 

@@ -33,6 +33,8 @@ std::string TMadeReport::Text(TReportParts const& parts) const {
   return fRedacted ? StoredReportAsText(Stored(), parts) : ReportAsText(fReport, parts);
 }
 
-TStoredReport TMadeReport::Stored() const { return StoredReportFrom(Document(EMessages::kWithoutSecrets).Text(), "this report"); }
+TStoredReport TMadeReport::Stored() const {
+  return StoredReportFrom(Document(EMessages::kWithoutSecrets).Text(kStoredReportLimit), "this report");
+}
 
 }  // namespace NQRVZEP20::zep

@@ -26,7 +26,7 @@ public:
 
   std::string const& Log() const { return fLog; }
 
-  // The report as it would be read back from its document.
+  // The report as it would be read back from its document. Throws TFailure with kExitNothing if that is too long to be stored.
   TStoredReport Stored() const;
 
 private:

@@ -6,6 +6,8 @@
 #include "TAddToVectorCallback.h"
 #include "collect/FailureOf.h"
 #include "collect/Sections.h"
+#include "collect/stored/StoredReport.h"
+#include "tools/zep/output/Failure.h"
 #include "tools/zep/output/FindingsJson.h"
 #include "tools/zep/output/InstanceJson.h"
 #include "tools/zep/output/PlugInRows.h"
@@ -14,6 +16,7 @@
 
 #include <cstring>
 #include <ctime>
+#include <filesystem>
 #include <string_view>
 
 namespace NQRVZEP20::zep {
@@ -97,6 +100,20 @@ TJson ClassesAsJson(std::vector<TPlugIn> const& plugIns) {
   return rows.AsJson();
 }
 
+// That of a recorded machine is where its plug-ins were.
+std::string DirectoryOfPlugIns(TReport const& report) {
+  if (report.fRecorded.empty() || report.fPlugIns.empty()) return PlugInDirectory();
+  return std::filesystem::path(report.fPlugIns.front().fFile).parent_path().string();
+}
+
+// Refuses a report that has become too long to be held in memory.
+void CheckLength(std::size_t bytes, std::size_t most) {
+  if (bytes > most)
+    throw TFailure(kExitNothing, "the report is longer than " + std::to_string(most >> 20) +
+                                     " MiB, the limit for a page, a comparison and a redacted report; print it with --json or "
+                                     "--format jsonl");
+}
+
 }  // namespace
 
 TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fMessages(messages), fPlugIns(&report.fPlugIns) {
@@ -110,7 +127,7 @@ TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fM
   fMembers["identity"] = RowsAsJson(report.fIdentity);
   fMembers["details"] = RowsAsJson(report.fDetails);
   fMembers["sections"] = SectionsAsJson(MakeSections(report.fPlugIns, SectionKeys()));
-  fMembers["plugInDirectory"] = PlugInDirectory();
+  fMembers["plugInDirectory"] = DirectoryOfPlugIns(report);
   fMembers["plugIns"] = PlugInsAsJson(report.fPlugIns);
   fMembers["classes"] = ClassesAsJson(report.fPlugIns);
   fMembers["instances"] = nullptr;
@@ -118,8 +135,11 @@ TReportDocument::TReportDocument(TReport const& report, EMessages messages) : fM
 
 void TReportDocument::ReadInstances() {
   TJson instances = TJson::array();
-  TJson failures =
-      ForEachInstance(TJsonText::kOnOneLine, [&](std::string const& text) { instances.push_back(TJson::parse(text)); });
+  std::size_t bytes = 0;
+  TJson failures = ForEachInstance(TJsonText::kOnOneLine, [&](std::string const& text) {
+    CheckLength(bytes += text.size(), kStoredReportLimit);
+    instances.push_back(TJson::parse(text));
+  });
   fMembers["instances"] = std::move(instances);
   if (!failures.empty()) fMembers["instanceFailures"] = std::move(failures);
   fPlugIns = nullptr;
@@ -137,9 +157,12 @@ void TReportDocument::Write(TWriter const& write) const {
   write("]" + TextOf(members).substr(begin + std::strlen("null")));
 }
 
-std::string TReportDocument::Text() const {
+std::string TReportDocument::Text(std::size_t most) const {
   std::string text;
-  Write([&text](std::string const& piece) { text += piece; });
+  Write([&text, most](std::string const& piece) {
+    CheckLength(text.size() + piece.size(), most);
+    text += piece;
+  });
   return text;
 }
 

@@ -30,7 +30,8 @@ public:
   TJson& Members() { return fMembers; }
   TJson const& Members() const { return fMembers; }
 
-  // Reads the instances now, so that they are members, too, and may be changed. The memory then depends on their number.
+  // Reads the instances now, so that they are members, too, and may be changed. The memory then depends on their number; throws
+  // TFailure with kExitNothing if they are longer than kStoredReportLimit.
   void ReadInstances();
 
   // Calls `write` with one piece of the text after the other; the text has the form of AsText. What `write` throws is passed on.
@@ -40,7 +41,8 @@ public:
   // and the failures: {"instances":402,"instanceFailures":[]}.
   void WriteLines(TWriter const& write) const;
 
-  std::string Text() const;
+  // The whole text. Throws TFailure with kExitNothing if it is longer than `most` bytes.
+  std::string Text(std::size_t most = std::string::npos) const;
 
 private:
   std::string TextOf(TJson json) const;

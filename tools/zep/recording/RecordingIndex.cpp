@@ -2,10 +2,14 @@
 #include "tools/zep/recording/RecordingIndex.h"
 
 #include "collect/SafeText.h"
+#include "collect/stored/StoredDocument.h"
+#include "tools/zep/processes/Interrupts.h"
 
 #include <algorithm>
 #include <array>
+#include <ctime>
 #include <set>
+#include <stdexcept>
 #include <string_view>
 
 namespace NQRVZEP20::zep {
@@ -41,6 +45,25 @@ bool IsWithinRoot(std::string const& path) {
   return path.back() != '/';
 }
 
+std::string TimeIn(TJson const& json) {
+  std::string const text = json.at("time").get<std::string>();
+  std::tm utc{};
+  char const* const end = ::strptime(text.c_str(), "%Y-%m-%dT%H:%M:%SZ", &utc);
+  if (end == nullptr || TimeText(::timegm(&utc)) != text) ThrowUnsound("the time " + Printable(text) + " is invalid");
+  return text;
+}
+
+TThresholds ThresholdsFrom(TJson const& json) {
+  try {
+    return TThresholds::From([&](std::string const& key) {
+      auto const value = json.find(key);
+      return value == json.end() ? "" : std::to_string(value->get<std::uint64_t>());
+    });
+  } catch (std::invalid_argument const& failure) {
+    ThrowUnsound(failure.what());
+  }
+}
+
 TRecordedMember MemberFrom(TJson const& json) {
   std::string const path = json.at("path").get<std::string>();
   if (!IsWithinRoot(path)) ThrowUnsound("the path " + Printable(path) + " leads out of the recording");
@@ -49,7 +72,7 @@ TRecordedMember MemberFrom(TJson const& json) {
   TRecordedMember recorded{{static_cast<EMemberKind>(kind - kKinds.begin()), path}};
   if (recorded.fMember.fKind == EMemberKind::kLink) recorded.fMember.fTarget = json.at("target").get<std::string>();
   if (recorded.fMember.fKind != EMemberKind::kFile) return recorded;
-  recorded.fTime = json.at("time").get<std::string>();
+  recorded.fTime = TimeIn(json);
   recorded.fBytes = json.at("bytes").get<std::uint64_t>();
   recorded.fSha256 = json.at("sha256").get<std::string>();
   recorded.fMark = json.value("mark", "");
@@ -57,9 +80,9 @@ TRecordedMember MemberFrom(TJson const& json) {
 }
 
 void CheckVersion(TJson const& json) {
-  int const version = json.at("recordingVersion").get<int>();
-  if (version == kRecordingVersion) return;
-  throw TArchiveError("it is a recording of the version " + std::to_string(version) + ", written by zep " +
+  TJson const& version = json.at("recordingVersion");
+  if (version.is_number_unsigned() && version.get<std::uint64_t>() == kRecordingVersion) return;
+  throw TArchiveError("it is a recording of the version " + Printable(version.dump()) + ", written by zep " +
                       Printable(json.value("zepVersion", "?")) + "; this zep reads only the version " +
                       std::to_string(kRecordingVersion));
 }
@@ -89,15 +112,23 @@ void CheckLimits(TRecordingIndex const& index) {
   }
 }
 
+// A member of the recording has seven values at most.
+constexpr TJsonBounds kIndexBounds{8, 100, 10 * kMostRecordedMembers};
+
 TRecordingIndex Read(TJson const& json) {
   CheckVersion(json);
   TRecordingIndex index;
-  index.fTime = json.at("time").get<std::string>();
+  index.fTime = TimeIn(json);
   index.fTool = json.at("zepVersion").get<std::string>();
+  index.fPlugInDirectory = json.value("plugInDirectory", "");
+  index.fThresholds = ThresholdsFrom(json.value("thresholds", TJson::object()));
   index.fPlugIns = json.at("plugIns").get<std::vector<std::string>>();
   for (TJson const& row : json.at("notRecorded"))
     index.fNotRecorded.push_back({row.at("plugIn").get<std::string>(), row.at("reason").get<std::string>()});
-  for (TJson const& member : json.at("members")) index.fMembers.push_back(MemberFrom(member));
+  for (TJson const& member : json.at("members")) {
+    ThrowIfInterrupted();
+    index.fMembers.push_back(MemberFrom(member));
+  }
   CheckLimits(index);
   CheckDirectories(index.fMembers);
   return index;
@@ -106,22 +137,22 @@ TRecordingIndex Read(TJson const& json) {
 }  // namespace
 
 std::string TextOf(TRecordingIndex const& index) {
-  TJson json{
-      {"recordingVersion", kRecordingVersion}, {"zepVersion", index.fTool}, {"time", index.fTime}, {"plugIns", index.fPlugIns},
-      {"notRecorded", TJson::array()},         {"members", TJson::array()}};
+  TJson json{{"recordingVersion", kRecordingVersion}, {"zepVersion", index.fTool}, {"time", index.fTime}};
+  json["plugInDirectory"] = WithBytesEscaped(index.fPlugInDirectory);
+  for (auto const& [key, value] : index.fThresholds.Settings()) json["thresholds"][key] = value;
+  for (char const* const list : {"plugIns", "notRecorded", "members"}) json[list] = TJson::array();
+  for (std::string const& plugIn : index.fPlugIns) json["plugIns"].push_back(WithBytesEscaped(plugIn));
   for (TNotRecorded const& row : index.fNotRecorded)
-    json["notRecorded"].push_back({{"plugIn", row.fPlugIn}, {"reason", row.fReason}});
+    json["notRecorded"].push_back({{"plugIn", WithBytesEscaped(row.fPlugIn)}, {"reason", WithBytesEscaped(row.fReason)}});
   for (TRecordedMember const& member : index.fMembers) json["members"].push_back(AsJson(member));
-  try {
-    return json.dump(1) + "\n";
-  } catch (TJson::type_error const&) {
-    throw std::runtime_error("a file of this machine has a name that is not UTF-8, which a recording cannot contain");
-  }
+  return json.dump(1) + "\n";
 }
 
 TRecordingIndex IndexFrom(std::string const& text) {
   try {
-    return Read(TJson::parse(text));
+    return Read(ParsedWithinBounds(text, kIndexBounds));
+  } catch (TStoredReportError const& failure) {
+    ThrowUnsound(failure.what());
   } catch (TJson::exception const& failure) {
     ThrowUnsound(Printable(failure.what()));
   }

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "collect/findings/TThresholds.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/recording/Archive.h"
 
@@ -28,7 +29,7 @@ struct TRecordedMember {
   std::string fMark = {};    // of a mark: its content (RecordedMark.h)
 };
 
-// A plug-in of which the recording has nothing.
+// A plug-in of which the recording has nothing, or a file of the machine that it cannot contain.
 struct TNotRecorded {
   std::string fPlugIn;  // its file
   std::string fReason;
@@ -37,11 +38,14 @@ struct TNotRecorded {
 struct TRecordingIndex {
   std::string fTime;                  // when all was read: "2026-11-23T04:05:06Z"
   std::string fTool;                  // the version of zep
+  std::string fPlugInDirectory = {};  // of that zep; empty in recordings of earlier versions
+  TThresholds fThresholds = {};       // of that machine
   std::vector<std::string> fPlugIns;  // the files of the plug-ins that were recorded: "libHost.nsp.so"
   std::vector<TNotRecorded> fNotRecorded;
   std::vector<TRecordedMember> fMembers;
 };
 
+// The names of members must be valid UTF-8 (WithBytesEscaped); bytes of other texts that are not become escapes.
 std::string TextOf(TRecordingIndex const& index);
 
 // Throws TArchiveError if the text is not an index, is that of a newer version, or names a member that no recording has.

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/recording/TRecorder.h"
 
+#include "collect/SafeText.h"
 #include "providers/reasons/RecordedMark.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/processes/Interrupts.h"
@@ -61,16 +62,22 @@ TRecordedMember MemberOf(fs::path const& path, std::string const& name) {
   return recorded;
 }
 
-// All members in the order of their names, so that a directory comes before its files.
-std::vector<TRecordedMember> MembersBelow(fs::path const& root) {
-  std::vector<TRecordedMember> members{MemberOf(root, kRecordedRoot)};
+bool IsUtf8(std::string const& text) { return WithBytesEscaped(text) == text; }
+
+// Adds all members in the order of their names, so that a directory comes before its files.
+void AddMembers(TRecordingIndex& index, fs::path const& root) {
+  std::vector<TRecordedMember>& members = index.fMembers;
+  members.push_back(MemberOf(root, kRecordedRoot));
   for (fs::directory_entry const& entry : fs::recursive_directory_iterator(root)) {
     ThrowIfInterrupted();
-    members.push_back(MemberOf(entry.path(), kRecordedRoot + ("/" + entry.path().lexically_relative(root).string())));
+    TRecordedMember member = MemberOf(entry.path(), kRecordedRoot + ("/" + entry.path().lexically_relative(root).string()));
+    if (IsUtf8(member.fMember.fName) && IsUtf8(member.fMember.fTarget))
+      members.push_back(std::move(member));
+    else
+      index.fNotRecorded.push_back({member.fMember.fName, "the name of this file, or the target of this link, is not UTF-8"});
   }
   std::sort(members.begin(), members.end(),
             [](auto const& one, auto const& other) { return one.fMember.fName < other.fMember.fName; });
-  return members;
 }
 
 // A plug-in that reads through TMachineFiles leaves a note: an empty file of its name, which is writable if something that it
@@ -116,14 +123,16 @@ TRecorder::TRecorder()
                   {"ZEP_HOST_NAME", ""},
                   {"ZEP_SCSI_DEVICES", ""}}) {}
 
-TRecorder::TResult TRecorder::Finish(std::vector<TPlugIn> const& plugIns) const {
+TRecorder::TResult TRecorder::Finish(std::vector<TPlugIn> const& plugIns, TThresholds const& thresholds) const {
   fs::path const root = fDirectory.Path(kRecordedRoot);
   TResult result;
   TRecordingIndex& index = result.fIndex;
   index.fTime = TimeText(std::time(nullptr));
   index.fTool = ZEP_VERSION;
+  index.fPlugInDirectory = PlugInDirectory();
+  index.fThresholds = thresholds;
   NamePlugIns(index, root, plugIns);
-  index.fMembers = MembersBelow(root);
+  AddMembers(index, root);
   CheckSize(index);
   TArchiveWriter archive;
   archive.Add({EMemberKind::kFile, kIndexName, {}, 0600, {std::time(nullptr), 0}}, TextOf(index));

@@ -17,12 +17,13 @@ class TRecorder {
 public:
   TRecorder();
 
-  // What was recorded of these plug-ins, as an index without checksums and a file of it.
+  // What was recorded of these plug-ins, as an index and a file of it. A file or link whose name or target is not UTF-8 is left
+  // out, with a reason. `thresholds` are those of this machine, for the findings of a replay.
   struct TResult {
     TRecordingIndex fIndex;
     std::string fArchive;
   };
-  TResult Finish(std::vector<TPlugIn> const& plugIns) const;
+  TResult Finish(std::vector<TPlugIn> const& plugIns, TThresholds const& thresholds = {}) const;
 
 private:
   TScratchDirectory fDirectory;

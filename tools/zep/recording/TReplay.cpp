@@ -2,10 +2,15 @@
 #include "tools/zep/recording/TReplay.h"
 
 #include "collect/SafeText.h"
+#include "core/Handles.h"
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/recording/UnpackRecording.h"
 
+#include <fcntl.h>
+
 #include <algorithm>
+#include <cerrno>
+#include <cstring>
 #include <filesystem>
 #include <iostream>
 #include <system_error>
@@ -19,6 +24,8 @@ namespace fs = std::filesystem;
 TRecordingIndex UnpackOrThrow(std::string const& file, std::string const& directory) {
   std::error_code ignored;
   if (!fs::is_regular_file(file, ignored)) throw TFailure(kExitNoInput, Printable(file) + " cannot be read: it is not a file");
+  if (!TUniqueFd(::open(file.c_str(), O_RDONLY | O_CLOEXEC)))
+    throw TFailure(kExitNoInput, Printable(file) + " cannot be read: " + std::strerror(errno));
   try {
     return UnpackRecording(file, directory);
   } catch (TArchiveError const& failure) {

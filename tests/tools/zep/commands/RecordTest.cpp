@@ -57,6 +57,21 @@ TEST_F(RecordTest, ARecordingIsOfOneMachine) {
   EXPECT_THAT(Run({"report", "--replay", "here.rec"}).fOutput, testing::Not(HasSubstr("other-host")));
 }
 
+// The thresholds and paths of the machine that replays do not matter.
+TEST_F(RecordTest, AReplayUsesTheThresholdsAndPathsOfTheRecordedMachine) {
+  WriteFile(fZep.Path("zep.cfg"), "finding-file-system-free-percent=42\n");
+  EXPECT_EQ(Run({"record", "here.rec"}).fStatus, 0);
+  WriteFile(fZep.Path("zep.cfg"), "finding-file-system-free-percent=7\n");
+  TInstallation const other;
+  TCall call{{"report", "--json", "--replay", fZep.Path("here.rec")}, {}};
+  call.fDirectory = fZep.Path("");
+  auto const document = nlohmann::json::parse(other.Run(call).fOutput);
+  EXPECT_EQ(document["findings"]["thresholds"]["finding-file-system-free-percent"], 42);
+  EXPECT_EQ(document["plugInDirectory"], nlohmann::json::parse(Run({"report", "--json"}).fOutput)["plugInDirectory"]);
+  EXPECT_THAT(document["plugIns"][0]["file"].get<std::string>(),
+              StartsWith(document["plugInDirectory"].get<std::string>() + "/"));
+}
+
 TEST_F(RecordTest, APlugInThatCannotBeRecordedIsNamedAndNotReplayed) {
   fZep.Add("libClock.nsp.so", CLOCK_PLUGIN);
   TRun const run = Run({"record", "here.rec"});

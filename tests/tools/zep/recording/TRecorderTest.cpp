@@ -47,5 +47,35 @@ TEST_F(TRecorderTest, EachPlugInIsRecordedOrHasTheReason) {
                   "libBad.nsp.so: it crashed"));
 }
 
+TEST_F(TRecorderTest, AFileWhoseNameIsNotUtf8IsLeftOutAndNamed) {
+  TRecorder const recorder;
+  Note("libWhole.nsp.so", fs::perms::owner_read);
+  fs::path const root = std::getenv("ZEP_ROOT");
+  WriteFile((root / "a\xff").string(), "");
+  WriteFile((root / "b").string(), "");
+  fs::create_symlink("x\xff", root / "c");
+  TRecordingIndex const index = recorder.Finish({PlugIn("libWhole.nsp.so")}).fIndex;
+  std::vector<std::string> names, left;
+  for (TRecordedMember const& member : index.fMembers) names.push_back(member.fMember.fName);
+  for (TNotRecorded const& row : index.fNotRecorded) left.push_back(row.fPlugIn);
+  EXPECT_THAT(names, ElementsAre("root", "root/b", "root/zep-plug-ins", "root/zep-plug-ins/libWhole.nsp.so"));
+  EXPECT_THAT(left, testing::UnorderedElementsAre("root/a\xff", "root/c"));
+  EXPECT_EQ(index.fNotRecorded[0].fReason, "the name of this file, or the target of this link, is not UTF-8");
+}
+
+// The bytes become escapes in the index.
+TEST_F(TRecorderTest, AReasonThatIsNotUtf8DoesNotPreventTheRecording) {
+  TRecordingIndex const index = TRecorder().Finish({PlugIn("libBad.nsp.so", "it \xff")}).fIndex;
+  EXPECT_EQ(IndexFrom(TextOf(index)).fNotRecorded.at(0).fReason, "it \\xff");
+}
+
+TEST_F(TRecorderTest, TheThresholdsAndTheDirectoryOfThePlugInsAreRecorded) {
+  TThresholds thresholds;
+  thresholds.fFileSystemFreePercent = 99;
+  TRecordingIndex const index = IndexFrom(TextOf(TRecorder().Finish({}, thresholds).fIndex));
+  EXPECT_EQ(index.fThresholds.Settings(), thresholds.Settings());
+  EXPECT_EQ(index.fPlugInDirectory, PlugInDirectory());
+}
+
 }  // namespace
 }  // namespace NQRVZEP20::zep

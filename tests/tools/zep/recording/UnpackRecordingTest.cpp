@@ -93,6 +93,9 @@ TEST_F(UnpackRecordingTest, AChangedRecordingIsRefusedByNameAndPlace) {
       {"it is cut: its member root/Müller is missing", [](TRecorded& r) { r.fParts.pop_back(); }},
       {"its member root/x is foreign, or contained twice", [](TRecorded& r) { r.fParts[1].fMember.fName = "root/x"; }},
       {"its member root/a is foreign, or contained twice", [](TRecorded& r) { r.fParts.push_back(r.fParts[1]); }},
+      {"recording.json is not sound: the time soon is invalid", [](TRecorded& r) { r.fIndex.fTime = "soon"; }},
+      {"recording.json is not sound: the time 2026-13-01T00:00:00Z is invalid",
+       [](TRecorded& r) { r.fIndex.fMembers[1].fTime = "2026-13-01T00:00:00Z"; }},
       {"recording.json is not sound: root/a is named twice",
        [](TRecorded& r) { r.fIndex.fMembers.push_back(r.fIndex.fMembers[1]); }},
       {"recording.json is not sound: the path root/../a leads out of the recording",
@@ -133,6 +136,20 @@ TEST_F(UnpackRecordingTest, AChangedRecordingIsRefusedByNameAndPlace) {
 TEST_F(UnpackRecordingTest, ANewerRecordingSaysSo) {
   EXPECT_EQ(WhyRefused(Packed(R"({"recordingVersion": 2, "zepVersion": "9.9.9"})", {})),
             "it is a recording of the version 2, written by zep 9.9.9; this zep reads only the version 1");
+  for (std::string const version : {"4294967297", "1.9", "-1", "true"})
+    EXPECT_THAT(WhyRefused(Packed("{\"recordingVersion\": " + version + "}", {})),
+                StartsWith("it is a recording of the version " + version + ", written by zep ?"));
+}
+
+// An index within its 64 MiB could otherwise take minutes or gigabytes.
+TEST_F(UnpackRecordingTest, AnIndexBeyondItsBoundsIsRefused) {
+  std::string wide = "{";
+  for (int at = 0; at < 80000; ++at) wide += "\"" + std::to_string(at) + "\":0,";
+  std::string many = "[0";
+  for (int at = 0; at < 2000000; ++at) many += ",0";
+  EXPECT_EQ(WhyRefused(Packed(std::string(1000000, '['), {})), "recording.json is not sound: the document is nested too deeply");
+  EXPECT_EQ(WhyRefused(Packed(wide + "\"x\":0}", {})), "recording.json is not sound: an object has more than 100 members");
+  EXPECT_EQ(WhyRefused(Packed(many + "]", {})), "recording.json is not sound: it has more than 2000000 values");
 }
 
 TEST_F(UnpackRecordingTest, AForeignOrCutFileIsRefused) {
