@@ -236,9 +236,7 @@ void ExpectGoodEnd(TCommand const& command, TEnd const& end, TFault const& fault
   for (std::string const& file : end.fFiles) {
     bool const isLock = file == command.fFile + ".lock";  // an empty lock may be left, and is used again
     bool const isNamed = end.fErrors.find(file + " cannot be removed") != end.fErrors.npos;
-    bool const hasNoMemory = end.fErrors.find("zep: not enough memory\n") != end.fErrors.npos;
-    bool const isOfEnd = hasNoMemory && file.rfind("zep-re", 0) == 0;  // see TScratchDirectory.h
-    EXPECT_TRUE(file == command.fFile || isLock || isNamed || isOfEnd) << file << " is left";
+    EXPECT_TRUE(file == command.fFile || isLock || isNamed) << file << " is left";
   }
   ExpectWholePage(end);
 }

@@ -8,6 +8,7 @@
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"
 #include "tools/zep/output/Text.h"
+#include "tools/zep/processes/TScratchDirectory.h"
 #include "tools/zep/processes/WriteWhole.h"
 #include "tools/zep/secrets/Password.h"
 #include "tools/zep/secrets/Secrets.h"
@@ -281,6 +282,7 @@ void SetEndWithoutMemory() {
       if (::getpid() == process && std::current_exception()) std::rethrow_exception(std::current_exception());
     } catch (std::bad_alloc const&) {
       WriteWhole(STDERR_FILENO, "zep: not enough memory\n");
+      TScratchDirectory::RemoveAll();
       ::_exit(kExitNothing);
     } catch (...) {
     }

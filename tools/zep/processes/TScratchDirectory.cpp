@@ -10,18 +10,37 @@
 #include <cerrno>
 #include <filesystem>
 #include <iostream>
+#include <new>
 #include <system_error>
 
 namespace NQRVZEP20::zep {
 
 namespace fs = std::filesystem;
 
-TScratchDirectory::TScratchDirectory(std::string const& name) : fPath((fs::temp_directory_path() / (name + ".XXXXXX")).string()) {
+TScratchDirectory* TScratchDirectory::fNewest = nullptr;
+
+TScratchDirectory::TScratchDirectory(std::string const& name)
+    : fPath((fs::temp_directory_path() / (name + ".XXXXXX")).string()), fOlder(fNewest) {
   if (::mkdtemp(fPath.data()) == nullptr)
     throw std::system_error(errno, std::generic_category(), "a temporary directory cannot be created");
+  fNewest = this;
 }
 
 TScratchDirectory::~TScratchDirectory() {
+  TScratchDirectory** newer = &fNewest;
+  while (*newer != this) newer = &(*newer)->fOlder;
+  *newer = fOlder;
+  Remove();
+}
+
+void TScratchDirectory::RemoveAll() {
+  for (TScratchDirectory* each = fNewest; each != nullptr; each = each->fOlder) try {
+      each->Remove();
+    } catch (std::bad_alloc const&) {  // for the message
+    }
+}
+
+void TScratchDirectory::Remove() {
   if (fIsKept) return;
   // Not std::filesystem::remove_all, which ends the program when memory runs out.
   constexpr int descriptors = 16;

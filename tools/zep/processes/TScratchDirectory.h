@@ -6,8 +6,7 @@
 namespace NQRVZEP20::zep {
 
 // A new temporary directory, which the destructor removes with its contents unless Keep has been called. If it cannot be removed,
-// its path and the reason are printed to standard error. It may be left when memory runs out in a place where no exception can be
-// caught, which ends zep.
+// its path and the reason are printed to standard error. For the main thread only.
 class TScratchDirectory {
 public:
   // Its name begins with `name`. Throws std::system_error when it cannot be created.
@@ -21,8 +20,16 @@ public:
 
   void Keep() { fIsKept = true; }
 
+  // Removes those that exist. For an end of the program without destructors.
+  static void RemoveAll();
+
 private:
+  void Remove();
+
+  static TScratchDirectory* fNewest;
+
   std::string fPath;
+  TScratchDirectory* fOlder;
   bool fIsKept = false;
 };
 
