@@ -140,7 +140,7 @@ std::optional<std::string> TSecretIndex::Rewritten(std::string_view text, TRepla
   return result += text.substr(copied);
 }
 
-// The hit at the word, or behind the escape that is its begin: "zx81" in "%20zx81".
+// The hit at the begin of the word, or after an escape with which the word begins: "zx81" in "%20zx81".
 TSecretIndex::THit TSecretIndex::HitAtWord(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const {
   if (THit const hit = HitAt(text, from, begin, end); hit.fEnd > 0) return hit;
   std::size_t const escape = SizeOfEscapeAt(text, begin);
