@@ -39,9 +39,10 @@ macro(zep_package component name synopsis text section copyright)
 endmacro()
 
 set(same_version "(= ${PROJECT_VERSION})")
-set(core "libzepcore1 ${same_version}")
+set(library libzepcore${PROJECT_VERSION_MAJOR})
+set(core "${library} ${same_version}")
 
-zep_package(library libzepcore1 "core library of a server diagnostic data collector"
+zep_package(library ${library} "core library of a server diagnostic data collector"
 "Identity, hardware and health of a server as CIM objects, which provider
 plug-ins collect. This package has the library, which plug-ins and front ends
 link, and its library for SMBIOS tables."

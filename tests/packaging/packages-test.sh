@@ -1,14 +1,14 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
 #
-# Makes the Debian packages of the build tree given. lintian must report nothing about them, and manual pages must be the help
-# texts. Then it unpacks libzepcore-dev with all packages of ours that it depends on, and makes a plug-in with nothing else: new,
-# build, and its class in the report.
+# Examines the Debian packages in a directory. lintian must report nothing about them, and manual pages must be the help texts. zep
+# must run without libzepcore-dev. Then the test unpacks libzepcore-dev with all packages of ours that it depends on, and makes a
+# plug-in with nothing else: new, build, and its class in the report. A plug-in of the build tree must be loaded, too.
 #
-#   packages-test.sh BUILD_DIR CXX
+#   packages-test.sh PACKAGES_DIR BUILD_DIR CXX
 set -euo pipefail
 export LC_ALL=C
-build=$1 cxx=$2
+packages=$1 build=$2 cxx=$3
 here=$(cd "$(dirname "$0")" && pwd)
 work=$(realpath "$(mktemp -d)")
 trap 'rm -rf "$work"' EXIT
@@ -19,19 +19,19 @@ fail() {  # fail REASON [FILE]
   exit 1
 }
 
-cpack --config "$build/CPackConfig.cmake" -B "$work/packages" >"$work/log" 2>&1 || fail "the packages are not made:" "$work/log"
-
 # Each provider is in its own package; the one that links code under the GPL is in libzepcore-ipmi, which states that.
-holds() { dpkg-deb --contents "$work/packages/$1"_*.deb | grep "/zepcore/$2\$" >/dev/null || fail "$2 is not in $1"; }
+holds() { dpkg-deb --contents "$packages/$1"_*.deb | grep "/zepcore/$2\$" >/dev/null || fail "$2 is not in $1"; }
 for name in Host Storage Network Devices Sensors; do holds "zep-provider-${name,,}" "lib$name.nsp.so"; done
-holds libzepcore1 libzepcore.so
+holds libzepcore1 "libzepcore\.so\.1\.[0-9.]*"
+holds libzepcore1 "libzepcore\.so\.1 -> libzepcore\.so\.1\.[0-9.]*"
+holds libzepcore-dev "libzepcore\.so -> libzepcore\.so\.1"
 holds libzepcore-ipmi libController.nsp.so
-dpkg-deb --fsys-tarfile "$work"/packages/libzepcore-ipmi_*.deb | tar -xO ./usr/share/doc/libzepcore-ipmi/copyright >"$work/log"
+dpkg-deb --fsys-tarfile "$packages"/libzepcore-ipmi_*.deb | tar -xO ./usr/share/doc/libzepcore-ipmi/copyright >"$work/log"
 grep -q '^License: GPL-3.0-or-later$' "$work/log" || fail "libzepcore-ipmi does not state its licence:" "$work/log"
 
 # The address of the maintainer is that of the person who makes the packages (ZEP_PACKAGE_CONTACT).
 if command -v lintian >/dev/null; then
-  lintian --allow-root --suppress-tags bogus-mail-host,bogus-mail-host-in-debian-changelog "$work"/packages/*.deb >"$work/log" 2>&1 ||
+  lintian --allow-root --suppress-tags bogus-mail-host,bogus-mail-host-in-debian-changelog "$packages"/*.deb >"$work/log" 2>&1 ||
     fail "lintian fails:" "$work/log"
   [[ ! -s $work/log ]] || fail "lintian reports:" "$work/log"
 else
@@ -42,13 +42,27 @@ fi
 # Unpacks the package and those of ours that it depends on.
 unpack() {  # unpack NAME
   local file depends
-  file=$(ls "$work/packages/$1"_*.deb 2>/dev/null) || return 0
+  file=$(ls "$packages/$1"_*.deb 2>/dev/null) || return 0
   [[ ! -e $work/unpacked/$1 ]] || return 0
   mkdir -p "$work/unpacked/$1"
   dpkg-deb --extract "$file" "$work/root"
   depends=$(dpkg-deb --field "$file" Depends | sed 's/([^)]*)//g; s/[|,]/ /g')
   for name in $depends; do unpack "$name"; done
 }
+soname_of() { readelf --wide --dynamic "$1" | sed -n 's/.*Library soname: \[\(.*\)\]/\1/p'; }
+
+# Without libzepcore-dev: the library has only its versioned names, and finds the plug-ins beside it.
+unpack zep
+libraries=$(dirname "$(find "$work/root" -name libzepcore.so.1)")
+[[ $(soname_of "$libraries/libzepcore.so.1") == libzepcore.so.1 ]] || fail "the SONAME of the packaged library is wrong"
+[[ ! -e $libraries/libzepcore.so ]] || fail "zep depends on the link libzepcore.so"
+"$work/root/usr/bin/zep" report --sample >"$work/log" || true  # an incomplete report is not a failure here
+grep -q 'Host .*root/' "$work/log" || fail "zep does not list its provider without libzepcore-dev:" "$work/log"
+
+# The library of a build tree is one file, which works under its name alone.
+[[ ! -L $build/lib/libzepcore.so && $(soname_of "$build/lib/libzepcore.so") == libzepcore.so ]] ||
+  fail "libzepcore.so of the build tree cannot be copied alone"
+
 unpack libzepcore-dev
 zep=$work/root/usr/bin/zep
 [[ -x $zep ]] || fail "libzepcore-dev does not bring zep"
@@ -73,4 +87,14 @@ cmake --build project >"$work/log" || fail "it is not built:" "$work/log"
 export ZEP_SMBIOS_TABLE=$work/root/usr/share/zepcore/sample/smbios.bin
 "$zep" report --section other --plugin project/libEverything.nsp.so >"$work/log" || true  # an incomplete report is not a failure here
 grep -q 'X_Everything .*root/everything' "$work/log" || fail "the class is not in the report:" "$work/log"
+
+# A plug-in that was linked in a build tree needs libzepcore.so; the link leads it to the library that is loaded already.
+cp "$build/examples/libClock.nsp.so" "$libraries/"
+"$zep" report --sample >"$work/log" || true
+grep -q 'Clock .*root/clock' "$work/log" || fail "a plug-in of the build tree is not loaded:" "$work/log"
+
+# A program that opens the library by its path: it is the library that a program linked against it has loaded.
+read -ra flags <<<"$(PKG_CONFIG_PATH=$(dirname "$libraries")/pkgconfig pkg-config --cflags --libs zepcore)"
+"$cxx" -std=c++17 "$here/opens-library.cpp" -o "$work/opens-library" "${flags[@]}"
+"$work/opens-library" "$libraries/libzepcore.so" >"$work/log" 2>&1 || fail "the library is loaded twice:" "$work/log"
 echo "the packages work, and a plug-in needs libzepcore-dev alone"
