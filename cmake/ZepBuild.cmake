@@ -68,6 +68,22 @@ function(zep_room name)
   target_include_directories(${name} PRIVATE ${PROJECT_SOURCE_DIR}/include ${PROJECT_SOURCE_DIR})
 endfunction()
 
+# With ZEP_UNITY, compiles the sources of a folder of the target together, which generates the code of templates once for all of
+# them; with the sanitizers, this code takes most of the time. Local names of a folder's sources must therefore differ. The named
+# sources of the target are compiled alone.
+function(zep_compile_folders_together target)
+  if(NOT ZEP_UNITY)
+    return()
+  endif()
+  get_target_property(sources ${target} SOURCES)
+  list(REMOVE_ITEM sources ${ARGN})
+  foreach(source IN LISTS sources)
+    get_filename_component(folder ${source} DIRECTORY)
+    set_source_files_properties(${source} PROPERTIES UNITY_GROUP "folder_${folder}")
+  endforeach()
+  set_target_properties(${target} PROPERTIES UNITY_BUILD ON UNITY_BUILD_MODE GROUP)
+endfunction()
+
 # A library that is loaded at run time. It is placed beside libzepcore.so under exactly the given file name. MAP: a version
 # script that lists the exported symbols, for a library that exports only some of those that its sources mark. A provider plug-in
 # exports nothing, and becomes one of the targets in the global property ZEP_PROVIDER_PLUGINS.

@@ -24,7 +24,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct TClassesArguments {
   bool fAsTree = false;
   bool fAsJson = false;
   bool fSample = false;
@@ -115,7 +115,7 @@ std::string AsJson(TClasses const& found) {
   return zep::AsText(document);
 }
 
-TClasses FindClasses(TArguments const& arguments) {
+TClasses FindClasses(TClassesArguments const& arguments) {
   TClasses classes;
   bool const isMof = !arguments.fMofFile.empty();
   auto const sample = SampleIf(arguments.fSample);
@@ -132,7 +132,7 @@ TClasses FindClasses(TArguments const& arguments) {
   return classes;
 }
 
-int Classes(TArguments const& arguments) {
+int Classes(TClassesArguments const& arguments) {
   TClasses const classes = FindClasses(arguments);
   WriteOutput(arguments.fAsJson ? AsJson(classes) : AsText(classes.fNamespaces, arguments.fAsTree));
   for (std::string const& reason : classes.Reasons()) std::cerr << "zep: " << Printable(reason) << "\n";
@@ -142,7 +142,7 @@ int Classes(TArguments const& arguments) {
 }  // namespace
 
 TRun AddClassesArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TClassesArguments>();
   command.add_flag("--tree", arguments->fAsTree, "Show each class indented below its superclass");
   auto* const mof =
       command.add_option("--mof", arguments->fMofFile, "List the classes of this MOF file instead of the providers'");

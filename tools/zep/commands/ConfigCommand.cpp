@@ -26,7 +26,7 @@ namespace {
 
 constexpr char const* kFileName = "zep.cfg";
 
-struct TArguments {
+struct TConfigArguments {
   std::optional<std::string> fKey;
   bool fAsJson = false;
 };
@@ -131,7 +131,7 @@ std::string AsJson(TSettings const& settings, EExitStatus status, std::string co
 }
 
 // Why there is no setting, or none of that key; empty when there is one.
-std::string WhyNothing(TArguments const& arguments, TSettings const& settings) {
+std::string WhyNothing(TConfigArguments const& arguments, TSettings const& settings) {
   if (!settings.fSettings.empty()) return "";
   if (!TOSSpecific::FileExists(kFileName)) return settings.fPath + " does not exist";
   if (TOSSpecific::GetFileSize(kFileName) == 0) return settings.fPath + " is empty";
@@ -141,7 +141,7 @@ std::string WhyNothing(TArguments const& arguments, TSettings const& settings) {
   return settings.fPath + " does not set \"" + *arguments.fKey + "\"";
 }
 
-int Config(TArguments const& arguments) {
+int Config(TConfigArguments const& arguments) {
   TSettings settings = ReadSettings();
   if (arguments.fKey) KeepOnly(*arguments.fKey, settings);
   bool const isAnything = !settings.fSettings.empty() || !settings.fIgnored.empty();
@@ -155,7 +155,7 @@ int Config(TArguments const& arguments) {
 }  // namespace
 
 TRun AddConfigArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TConfigArguments>();
   command.add_option("key", arguments->fKey, "Show only this setting and the ignored lines with its key");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.footer(

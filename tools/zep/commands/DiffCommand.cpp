@@ -13,11 +13,11 @@
 namespace NQRVZEP20::zep {
 
 TRun AddDiffArguments(CLI::App& command) {
-  struct TArguments {
+  struct TDiffArguments {
     std::string fBefore, fAfter;
     TDifferenceOutput fOutput;
   };
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TDiffArguments>();
   command.add_option("before", arguments->fBefore, "The earlier report, a file with the output of zep report --json")->required();
   command.add_option("after", arguments->fAfter, "The later report")->required();
   command.add_flag("--json", arguments->fOutput.fAsJson, "Print one JSON document");

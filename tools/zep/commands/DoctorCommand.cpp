@@ -23,7 +23,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct TDoctorArguments {
   TPlugInArguments fPlugIns;
   bool fAsJson = false;
 };
@@ -79,7 +79,7 @@ std::string AsJson(std::vector<TCheck> const& checks) {
   return zep::AsText(document);
 }
 
-int Doctor(TArguments const& arguments) {
+int Doctor(TDoctorArguments const& arguments) {
   std::vector<TCheck> const checks = CheckAll(arguments.fPlugIns);
   WriteOutput(arguments.fAsJson ? AsJson(checks) : AsText(checks));
   return StatusOf(checks);
@@ -88,7 +88,7 @@ int Doctor(TArguments const& arguments) {
 }  // namespace
 
 TRun AddDoctorArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TDoctorArguments>();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddPlugInOptions(command, arguments->fPlugIns);
   command.footer(

@@ -20,7 +20,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct TGetArguments {
   std::string fUrl, fFile;
   bool fForce = false, fNoClobber = false, fAsJson = false;
   TTransferOptions fOptions;
@@ -45,7 +45,7 @@ bool IsOverwritingWanted(std::string const& file) {
 
 // Why the file may not be written; empty when it may. Prompts only when standard input is a terminal. A device, a broken link
 // and the like are never replaced.
-std::string WhyNotWritten(TArguments const& arguments, std::string const& file, fs::file_status const& status) {
+std::string WhyNotWritten(TGetArguments const& arguments, std::string const& file, fs::file_status const& status) {
   if (!fs::exists(status)) return "";
   if (fs::is_directory(status)) return Printable(file) + " is a directory";
   if (!fs::is_regular_file(status)) return Printable(file) + " is not a regular file";
@@ -60,12 +60,12 @@ int Refuse(TRemote const& source, std::string const& file, std::string const& wh
   refused.fOutcome = {kZEPStatusAlreadyExists, kExitNotWritten, why};
   refused.fUrl = ShownUrlOf(source);
   refused.fFile = file;
-  if (asJson) WriteOutput(AsText(DocumentOf(refused, "zep get")));
+  if (asJson) WriteOutput(zep::AsText(DocumentOf(refused, "zep get")));
   std::cerr << "zep: " << why << "\n";
   return kExitNotWritten;
 }
 
-int Get(TArguments const& arguments) {
+int Get(TGetArguments const& arguments) {
   if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the URL comes first, the file second");
   TTarget const source = TargetOf(arguments.fUrl, false);
   if (source.fIsHost) throw TWrongUsage("a URL is needed, ftp:// or sftp://");
@@ -85,7 +85,7 @@ int Get(TArguments const& arguments) {
 }  // namespace
 
 TRun AddGetArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TGetArguments>();
   command.add_option("url", arguments->fUrl, "ftp://[USER@]HOST[:PORT]/PATH or sftp://...")->required();
   command.add_option("file", arguments->fFile, "The file to write")->required();
   CLI::Option* const force = command.add_flag("--force", arguments->fForce, "Overwrite an existing file without confirmation");

@@ -17,7 +17,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct THelpArguments {
   std::vector<std::string> fCommand;  // "media mount"; empty for zep itself
   std::string fShell;                 // whose completion is printed; empty for help
   bool fAsJson = false;
@@ -37,13 +37,13 @@ std::string HelpOf(CLI::App const& zep, std::vector<std::string> const& words) {
                               CLI::AppFormatMode::Normal);
 }
 
-int Help(CLI::App const& zep, TArguments const& arguments) {
+int Help(CLI::App const& zep, THelpArguments const& arguments) {
   bool const isHelp = arguments.fShell.empty();
   if (!isHelp && !arguments.fCommand.empty()) throw TWrongUsage("--completion is for all commands together");
   std::string const text = isHelp ? HelpOf(zep, arguments.fCommand) : CompletionFor(arguments.fShell, zep);
   TJson document = DocumentHead("zep help", kExitComplete, "");
   document["text"] = text;
-  WriteOutput(arguments.fAsJson ? AsText(document) : text);
+  WriteOutput(arguments.fAsJson ? zep::AsText(document) : text);
   return kExitComplete;
 }
 
@@ -56,7 +56,7 @@ CLI::App const* CommandNamed(CLI::App const& app, std::string const& name) {
 }
 
 TRun AddHelpArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<THelpArguments>();
   command.add_option("command", arguments->fCommand, "The command; without one, all commands are listed");
   command
       .add_option("--completion", arguments->fShell,

@@ -19,7 +19,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct TMediaArguments {
   bool fAsJson = false;
   std::string fDevice;     // to mount
   std::string fDirectory;  // to unmount
@@ -96,7 +96,7 @@ int Unmount(std::string const& argument, bool asJson) {
   return status;
 }
 
-int Media(TArguments const& arguments) {
+int Media(TMediaArguments const& arguments) {
   if (!arguments.fDevice.empty()) return Mount(arguments.fDevice, arguments.fAsJson);
   if (!arguments.fDirectory.empty()) return Unmount(arguments.fDirectory, arguments.fAsJson);
   return List(arguments.fAsJson);
@@ -105,7 +105,7 @@ int Media(TArguments const& arguments) {
 }  // namespace
 
 TRun AddMediaArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TMediaArguments>();
   CLI::App* const list = command.add_subcommand(kListMedia, "List removable media; the default");
   CLI::App* const mount = command.add_subcommand("mount", "Mount a medium at /mnt/key, or a floppy at /mnt/floppy");
   CLI::App* const unmount = command.add_subcommand("umount", "Unmount a medium so that it can be removed");

@@ -24,7 +24,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct TMofArguments {
   std::string fFile;
   bool fPrint = false;
   bool fAsJson = false;
@@ -107,14 +107,14 @@ std::string AsJson(std::string const& file, TCensus const& census) {
   return zep::AsText(document);
 }
 
-std::string MofAsText(TArguments const& arguments) {
+std::string MofAsText(TMofArguments const& arguments) {
   TNamespaceView const view = ViewOfMof(arguments.fFile);
   if (arguments.fPrint) return WriteMof(*view.Get());
   TCensus const census(*view.Get());
   return arguments.fAsJson ? AsJson(arguments.fFile, census) : AsText(arguments.fFile, census);
 }
 
-int Mof(TArguments const& arguments) {
+int Mof(TMofArguments const& arguments) {
   WriteOutput(MofAsText(arguments));
   return kExitComplete;
 }
@@ -122,7 +122,7 @@ int Mof(TArguments const& arguments) {
 }  // namespace
 
 TRun AddMofArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TMofArguments>();
   command.add_option("file", arguments->fFile, "The MOF file; it may include files in its directory and below")->required();
   auto* const print = command.add_flag("--print", arguments->fPrint, "Print the complete schema as a single MOF text");
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document")->excludes(print);

@@ -24,7 +24,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct TPluginArguments {
   std::string fName;
   std::string fClass;
   std::string fFile;  // to check; empty when a project is to be made
@@ -48,14 +48,14 @@ std::string AsJson(TNewPlugIn const& made, std::string const& mofFile) {
   return zep::AsText(document);
 }
 
-int New(TArguments const& arguments) {
+int New(TPluginArguments const& arguments) {
   std::string const mofFile = arguments.fMofFile.empty() ? SchemaFile() : arguments.fMofFile;
   TNewPlugIn const made = MakePlugIn(arguments.fName, arguments.fClass, mofFile);
   WriteMessage(arguments.fAsJson ? AsJson(made, mofFile) : AsText(made));
   return kExitComplete;
 }
 
-int Check(TArguments const& arguments) {
+int Check(TPluginArguments const& arguments) {
   TObservation const observation = Observe(arguments.fFile, arguments.fMofFile, arguments.fPlugIns);
   std::vector<TRuleResult> const results = CheckRules(observation);
   WriteOutput(arguments.fAsJson ? zep::AsText(CheckAsJson(observation, results)) : CheckAsText(observation, results));
@@ -65,7 +65,7 @@ int Check(TArguments const& arguments) {
   return kExitNothing;
 }
 
-void AddNew(CLI::App& command, TArguments& arguments) {
+void AddNew(CLI::App& command, TPluginArguments& arguments) {
   command.add_option("name", arguments.fName, "The name of the plug-in and of its new directory")->required();
   command.add_option("--class", arguments.fClass, "The class of the objects that the plug-in describes")->required();
   command.add_option("--mof", arguments.fMofFile, "The MOF file that has the class");
@@ -77,7 +77,7 @@ void AddNew(CLI::App& command, TArguments& arguments) {
       "Exit status: 0 when the directory was written, 1 when it was not, 64 for wrong usage.");
 }
 
-void AddCheck(CLI::App& command, TArguments& arguments) {
+void AddCheck(CLI::App& command, TPluginArguments& arguments) {
   command.add_option("file", arguments.fFile, "The plug-in, such as build/libDisks.nsp.so")->required();
   command.add_option("--mof", arguments.fMofFile, "The MOF file with the schema that the classes are compared with");
   AddLimitOptions(command, arguments.fPlugIns);
@@ -91,7 +91,7 @@ void AddCheck(CLI::App& command, TArguments& arguments) {
 }  // namespace
 
 TRun AddPluginArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TPluginArguments>();
   CLI::App* const create = command.add_subcommand("new", "Write the project of a new provider plug-in");
   CLI::App* const check = command.add_subcommand("check", "Check a provider plug-in, rule by rule");
   AddNew(*create, *arguments);

@@ -26,7 +26,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct TPluginsArguments {
   bool fAsJson = false;
   bool fSample = false;
   TPlugInArguments fPlugIns;
@@ -140,7 +140,7 @@ EExitStatus StatusOf(std::vector<TEntry> const& entries) {
   return std::all_of(entries.begin(), entries.end(), isGood) ? kExitComplete : kExitPartial;
 }
 
-int Plugins(TArguments const& arguments) {
+int Plugins(TPluginsArguments const& arguments) {
   auto const sample = SampleIf(arguments.fSample);
   std::vector<TPlugInFile> const files = FindPlugInsFor(arguments.fPlugIns);
   std::vector<TEntry> const entries = EntriesOf(files, LoadPlugInsFor(arguments.fPlugIns, sample, files));
@@ -166,7 +166,7 @@ int Plugins(TArguments const& arguments) {
 }  // namespace
 
 TRun AddPluginsArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TPluginsArguments>();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.add_flag("--sample", arguments->fSample, "Let the plug-ins read the bundled sample, labelled SAMPLE");
   AddPlugInOptions(command, arguments->fPlugIns);

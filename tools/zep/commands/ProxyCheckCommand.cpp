@@ -26,7 +26,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct TProxyCheckArguments {
   std::string fProxy;
   bool fAsJson = false;
   std::uint64_t fMostBytes = 1 << 20;
@@ -98,7 +98,7 @@ void ExplainNoConnection(TOutcome& outcome, TRemote const& proxy) {
 }
 
 // The proxy may return a page of its own, such as a refusal, so the page is searched for its text.
-TOutcome Check(TRemote const& proxy, TArguments const& arguments) {
+TOutcome Check(TRemote const& proxy, TProxyCheckArguments const& arguments) {
   TScratchDirectory const scratch("zep-proxy-check");  // the library writes the page into the working directory
   std::string const pageFile = scratch.Path("content.html");
   TWatch const watch{pageFile, nullptr, arguments.fOptions.fStallSeconds, arguments.fMostBytes, {}};
@@ -134,7 +134,7 @@ int Tell(std::string const& proxy, TOutcome const& outcome, bool asJson, bool qu
   return outcome.fExit;
 }
 
-int ProxyCheck(TArguments const& arguments) {
+int ProxyCheck(TProxyCheckArguments const& arguments) {
   TRemote proxy = RemoteOf(arguments.fProxy, "http");
   if (proxy.fScheme != "http" || !proxy.fPath.empty()) throw TWrongUsage("a proxy is [USER@]HOST:PORT");
   if (proxy.fPort.empty()) throw TWrongUsage("the port of the proxy is missing");
@@ -148,7 +148,7 @@ int ProxyCheck(TArguments const& arguments) {
 }  // namespace
 
 TRun AddProxyCheckArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TProxyCheckArguments>();
   command.add_option("proxy", arguments->fProxy, "[USER@]HOST:PORT")->required();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   AddSizeOption(command, "--max-page", arguments->fMostBytes,

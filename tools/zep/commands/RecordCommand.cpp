@@ -22,22 +22,20 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-constexpr char const* kDocument = "zep record";
-
-struct TArguments {
+struct TRecordArguments {
   std::string fFile;
   bool fAsJson = false;
   TPlugInArguments fPlugIns;
 };
 
 // The members of a recording by what they stand for.
-struct TCounts {
+struct TMemberCounts {
   std::size_t fFiles = 0, fRefused = 0, fListed = 0;
   std::uint64_t fBytes = 0;
 };
 
-TCounts CountsOf(TRecordingIndex const& index) {
-  TCounts counts;
+TMemberCounts CountsOf(TRecordingIndex const& index) {
+  TMemberCounts counts;
   for (TRecordedMember const& recorded : index.fMembers) {
     if (recorded.fMember.fKind != EMemberKind::kFile) continue;
     if (recorded.fMark.empty()) {
@@ -60,7 +58,7 @@ std::string ReasonOf(TRecordingIndex const& index) {
 }
 
 std::string TextAbout(std::string const& file, TRecordingIndex const& index, std::size_t size) {
-  TCounts const counts = CountsOf(index);
+  TMemberCounts const counts = CountsOf(index);
   std::string text = "The recording " + Printable(file) + " has " + std::to_string(counts.fFiles) + " files and answers with " +
                      std::to_string(counts.fBytes) + " bytes, compressed to " + std::to_string(size) + ", and " +
                      std::to_string(counts.fRefused) + " refusals.\n";
@@ -70,8 +68,8 @@ std::string TextAbout(std::string const& file, TRecordingIndex const& index, std
 }
 
 TJson DocumentAbout(std::string const& file, TRecordingIndex const& index, std::size_t size, EExitStatus status) {
-  TCounts const counts = CountsOf(index);
-  TJson document = DocumentHead(kDocument, status, ReasonOf(index));
+  TMemberCounts const counts = CountsOf(index);
+  TJson document = DocumentHead("zep record", status, ReasonOf(index));
   document["file"] = MessageWithoutSecrets(file);
   document["bytes"] = size;
   document["time"] = index.fTime;
@@ -91,7 +89,7 @@ EExitStatus StatusOf(TRecordingIndex const& index) {
   return index.fNotRecorded.empty() ? kExitComplete : kExitPartial;
 }
 
-int Record(TArguments const& arguments) {
+int Record(TRecordArguments const& arguments) {
   TInterruptGuard const guard;
   TRecorder const recorder;
   auto const [index, archive] = recorder.Finish(LoadPlugInsFor(arguments.fPlugIns, std::nullopt), ThresholdSettings());
@@ -99,7 +97,7 @@ int Record(TArguments const& arguments) {
   WritePrivateFile(arguments.fFile, archive);
   EExitStatus const status = StatusOf(index);
   if (arguments.fAsJson)
-    WriteOutput(AsText(DocumentAbout(arguments.fFile, index, archive.size(), status)));
+    WriteOutput(zep::AsText(DocumentAbout(arguments.fFile, index, archive.size(), status)));
   else
     WriteMessage(TextAbout(arguments.fFile, index, archive.size()));
   return status;
@@ -108,7 +106,7 @@ int Record(TArguments const& arguments) {
 }  // namespace
 
 TRun AddRecordArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TRecordArguments>();
   command.add_option("file", arguments->fFile, "The recording to write, a zstd-compressed tar archive")->required();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document about the recording");
   AddPlugInOptions(command, arguments->fPlugIns);

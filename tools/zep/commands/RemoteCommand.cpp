@@ -35,7 +35,7 @@ namespace {
 
 using namespace std::string_literals;
 
-struct TArguments {
+struct TRemoteArguments {
   std::string fHost, fHostsFile, fUser, fPasswordFile, fDebugLog;
   int fParallel = 32;
   int fTimeoutSeconds = 120;
@@ -115,14 +115,15 @@ void WriteDebugLog(std::string const& path) {
 }
 
 // A tenth of the time remains for sending what was read.
-TInventoryLimits InventoryLimitsOf(TArguments const& arguments) {
+TInventoryLimits InventoryLimitsOf(TRemoteArguments const& arguments) {
   return {std::chrono::milliseconds(900) * arguments.fTimeoutSeconds, !arguments.fHost.empty() && CanRedrawErrors()};
 }
 
-using TReport = std::function<void(TRemoteIdentity const&)>;
+using TReportHost = std::function<void(TRemoteIdentity const&)>;
 
 // Asks the controller of each host, and reports each as soon as it is known. Returns an EExitStatus.
-int AskAll(std::vector<std::string> const& hosts, TAccount const& account, TArguments const& arguments, TReport const& report) {
+int AskAll(std::vector<std::string> const& hosts, TAccount const& account, TRemoteArguments const& arguments,
+           TReportHost const& report) {
   IIPMILan::Initialize()->IpmilanCloseConnect();  // loads the IPMI client library once, for all processes
   std::size_t complete = 0, nothing = 0;
   TInventoryLimits const inventory = InventoryLimitsOf(arguments);
@@ -144,14 +145,14 @@ int AskAll(std::vector<std::string> const& hosts, TAccount const& account, TArgu
   return nothing == hosts.size() ? kExitNothing : kExitPartial;
 }
 
-int AskOne(TAccount const& account, TArguments const& arguments, TThresholds const& thresholds) {
+int AskOne(TAccount const& account, TRemoteArguments const& arguments, TThresholds const& thresholds) {
   return AskAll({arguments.fHost}, account, arguments, [&](TRemoteIdentity const& identity) {
-    WriteOutput(arguments.fAsJson ? AsText(AsJson(identity, thresholds)) : AsText(identity, thresholds));
+    WriteOutput(arguments.fAsJson ? zep::AsText(AsJson(identity, thresholds)) : AsText(identity, thresholds));
     if (!identity.fError.empty()) std::cerr << "zep: " << Printable(identity.fHost + ": " + identity.fError) << "\n";
   });
 }
 
-int AskList(std::vector<std::string> const& hosts, TAccount const& account, TArguments const& arguments,
+int AskList(std::vector<std::string> const& hosts, TAccount const& account, TRemoteArguments const& arguments,
             TThresholds const& thresholds) {
   TProgress progress(hosts.size());
   return AskAll(hosts, account, arguments, [&](TRemoteIdentity const& identity) {
@@ -166,7 +167,7 @@ void HideAfterColon(std::string const& user) {
   if (colon != user.npos) TSecret const hidden(std::string_view(user).substr(colon + 1));
 }
 
-int Remote(TArguments const& arguments) {
+int Remote(TRemoteArguments const& arguments) {
   if (arguments.fHost.empty() == arguments.fHostsFile.empty())
     throw TWrongUsage("either a host or a file of hosts (--hosts) is required");
   if (!arguments.fHost.empty() && !IsHostName(arguments.fHost)) throw TWrongUsage("the host is "s + kNoHostName);
@@ -182,7 +183,7 @@ int Remote(TArguments const& arguments) {
 }  // namespace
 
 TRun AddRemoteArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TRemoteArguments>();
   command.add_option("host", arguments->fHost, "The controller's host name or address");
   command.add_option("--hosts", arguments->fHostsFile,
                      "Query the hosts in this file, one per line, and print one JSON document per line");

@@ -41,7 +41,7 @@ int ReportFrom(TReportArguments const& arguments) {
   if (!arguments.fAsJson && !arguments.fBundle.IsWanted()) {
     TStoredReport const report = ReadReport(arguments.fFrom, arguments.fRedaction);
     PrintOrWritePage(report, arguments.fHtmlFile);
-    return StatusOf(report);
+    return zep::StatusOf(report);
   }
   if (arguments.fAsJson && !arguments.fRedaction.IsWanted())
     throw TWrongUsage("--from and --json exclude each other without --redact");
@@ -51,7 +51,7 @@ int ReportFrom(TReportArguments const& arguments) {
   if (!arguments.fHtmlFile.empty()) PrintOrWritePage(report, arguments.fHtmlFile);
   if (arguments.fBundle.IsWanted()) BundleFrom(document, arguments);
   if (arguments.fAsJson) WriteOutput(AsVerbatimText(document));
-  return StatusOf(report);
+  return zep::StatusOf(report);
 }
 
 TReport ReportHere(std::optional<TSample> const& sample, TReportArguments const& arguments) {
@@ -107,10 +107,10 @@ int Report(TReportArguments const& arguments) {
     return Deliver(made, evidence, target, arguments, guard);
   } catch (std::exception const& failure) {
     bool const isOfMedium = !arguments.fMedium.empty() && arguments.fAsJson && !HasWrittenOutput();
-    if (isOfMedium) WriteOutput(FailureAsJson(kToMedia, StatusOf(failure), failure.what(), sample ? sample->fLabel : ""));
+    if (isOfMedium) WriteOutput(FailureAsJson(kToMedia, zep::StatusOf(failure), failure.what(), sample ? sample->fLabel : ""));
     if (PendingInterrupt() == 0) throw;
     std::cerr << "zep: " << Printable(failure.what()) << "\n";
-    return StatusOf(failure);
+    return zep::StatusOf(failure);
   }
 }
 

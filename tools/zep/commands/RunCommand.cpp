@@ -27,7 +27,7 @@ namespace {
 
 constexpr int kForEver = -1;
 
-struct TArguments {
+struct TRunArguments {
   int fTimeoutSeconds = kForEver;
   bool fAsJson = false;
 };
@@ -57,10 +57,10 @@ std::string AsJson(std::vector<std::string> const& commandLine, std::string cons
   TJson document = DocumentHead("zep run", failure.empty() ? kExitComplete : kExitNothing, failure);
   document["command"] = commandLine;
   document["output"] = WithoutSecrets(output);
-  return AsText(document);
+  return zep::AsText(document);
 }
 
-int RunCommandLine(std::vector<std::string> commandLine, TArguments const& arguments) {
+int RunCommandLine(std::vector<std::string> commandLine, TRunArguments const& arguments) {
   if (!commandLine.empty()) commandLine.erase(commandLine.begin());  // kCommandFollows
   if (commandLine.empty() || commandLine.front().empty()) throw TWrongUsage("there is no command to run");
   std::string const program = commandLine.front();
@@ -77,7 +77,7 @@ int RunCommandLine(std::vector<std::string> commandLine, TArguments const& argum
 }  // namespace
 
 TRun AddRunArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TRunArguments>();
   command
       .add_option("--timeout", arguments->fTimeoutSeconds,
                   "The longest time without output, in seconds; -1, the default, waits forever")

@@ -15,13 +15,13 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct TSendArguments {
   std::string fFile, fTarget, fName;
   bool fBySftp = false, fAsJson = false;
   TTransferOptions fOptions;
 };
 
-int Send(TArguments const& arguments) {
+int Send(TSendArguments const& arguments) {
   if (IsUrl(arguments.fFile)) throw TWrongUsage("FILE is a URL; the file comes first, the target second");
   TTarget const target = TargetOf(arguments.fTarget, arguments.fBySftp);
   std::string const& path = target.fRemote.fPath;
@@ -36,7 +36,7 @@ int Send(TArguments const& arguments) {
 }  // namespace
 
 TRun AddSendArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TSendArguments>();
   command.add_option("file", arguments->fFile, "The file to send")->required();
   command.add_option("target", arguments->fTarget, "ftp://[USER@]HOST[:PORT]/PATH, sftp://..., or [USER@]HOST[:PORT] alone")
       ->required();

@@ -37,7 +37,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct TShowArguments {
   std::string fPath;
   bool fAsJson = false;
   bool fSample = false;
@@ -245,7 +245,7 @@ TJson ElementAsJson(TNamespaceView const& view, boost::shared_ptr<ICIMElement> c
       [&](boost::shared_ptr<ICIMClass const> cls) { return ClassAsJson(view, cls); });
 }
 
-struct TSearch {
+struct TFoundElement {
   bool fIsFound = false;
   std::string fText;                   // the object as it is printed
   TJson fObject;                       // the same for a document; only with --json
@@ -256,8 +256,8 @@ struct TSearch {
   EExitStatus ExitStatus() const { return !fIsFound ? kExitNothing : fFailures.empty() ? kExitComplete : kExitPartial; }
 };
 
-TSearch Search(TArguments const& arguments) {
-  TSearch search;
+TFoundElement FindElement(TShowArguments const& arguments) {
+  TFoundElement search;
   bool const isMof = !arguments.fMofFile.empty();
   auto const sample = SampleIf(arguments.fSample);
   std::vector<TPlugIn> const plugIns = isMof ? std::vector<TPlugIn>() : LoadPlugInsFor(arguments.fPlugIns, sample);
@@ -280,7 +280,7 @@ TSearch Search(TArguments const& arguments) {
   return search;
 }
 
-std::vector<std::string> ReasonsOf(TSearch const& search, TArguments const& arguments) {
+std::vector<std::string> ReasonsOf(TFoundElement const& search, TShowArguments const& arguments) {
   std::vector<std::string> reasons = search.fFailures;
   if (!search.fIsFound)
     reasons.push_back((arguments.fMofFile.empty() ? "no provider has the" : arguments.fMofFile + " has no") + " object \"" +
@@ -288,15 +288,15 @@ std::vector<std::string> ReasonsOf(TSearch const& search, TArguments const& argu
   return reasons;
 }
 
-std::string AsJson(TSearch const& search, std::string const& reason) {
+std::string AsJson(TFoundElement const& search, std::string const& reason) {
   TJson document = DocumentHead("zep show", search.ExitStatus(), reason, search.fSampleLabel);
   document["failedPlugIns"] = search.fFailedPlugIns;
   if (search.fIsFound) document["object"] = search.fObject;
-  return search.fIsFound ? AsText(document) : AsLine(document);
+  return search.fIsFound ? zep::AsText(document) : AsLine(document);
 }
 
-int Show(TArguments const& arguments) {
-  TSearch const search = Search(arguments);
+int Show(TShowArguments const& arguments) {
+  TFoundElement const search = FindElement(arguments);
   std::vector<std::string> const reasons = ReasonsOf(search, arguments);
   if (arguments.fAsJson)
     WriteOutput(AsJson(search, Joined(reasons, "; ")));
@@ -309,7 +309,7 @@ int Show(TArguments const& arguments) {
 }  // namespace
 
 TRun AddShowArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TShowArguments>();
   command.add_option("path", arguments->fPath, "A class, such as CIM_Chassis, or an object path that zep report --json prints")
       ->required();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");

@@ -32,11 +32,11 @@ int Unredacted(std::string const& file, std::string const& map) {
 }  // namespace
 
 TRun AddUnredactArguments(CLI::App& command) {
-  struct TArguments {
+  struct TUnredactArguments {
     std::string fFile, fMap;
     bool fAsJson = false;
   };
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TUnredactArguments>();
   command.add_option("file", arguments->fFile, "The redacted report, a file with the output of zep report --json --redact")
       ->required();
   command

@@ -20,9 +20,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-constexpr char const* kDocument = "zep verify";
-
-struct TArguments {
+struct TVerifyArguments {
   std::string fFile;
   bool fAsJson = false;
   TTrust fTrust;
@@ -44,7 +42,7 @@ std::string TextAboutSigner(TBundleCheck const& check, bool isTrusted) {
          ", which was not checked: anyone can make such a certificate. --signer or --ca checks it.";
 }
 
-std::string TextAbout(TBundleCheck const& check, TArguments const& arguments) {
+std::string TextAbout(TBundleCheck const& check, TVerifyArguments const& arguments) {
   TBundleManifest const& manifest = check.fManifest;
   std::string text = Printable(arguments.fFile) + ": a bundle that zep " + Printable(manifest.fTool) + " made at " +
                      Printable(manifest.fTime) + "\n";
@@ -56,9 +54,9 @@ std::string TextAbout(TBundleCheck const& check, TArguments const& arguments) {
   return text + "All pieces are as the manifest says. " + Printable(TextAboutSigner(check, arguments.fTrust.IsWanted())) + "\n";
 }
 
-TJson DocumentAbout(TBundleCheck const& check, TArguments const& arguments, EExitStatus status) {
+TJson DocumentAbout(TBundleCheck const& check, TVerifyArguments const& arguments, EExitStatus status) {
   TBundleManifest const& manifest = check.fManifest;
-  TJson document = DocumentHead(kDocument, status, ReasonOf(check));
+  TJson document = DocumentHead("zep verify", status, ReasonOf(check));
   document["file"] = MessageWithoutSecrets(arguments.fFile);
   document["zepVersion"] = manifest.fTool;
   document["time"] = manifest.fTime;
@@ -79,7 +77,7 @@ TJson DocumentAbout(TBundleCheck const& check, TArguments const& arguments, EExi
   return document;
 }
 
-TBundleCheck CheckOrThrow(TArguments const& arguments) {
+TBundleCheck CheckOrThrow(TVerifyArguments const& arguments) {
   std::error_code ignored;
   std::string const name = Printable(arguments.fFile);
   if (!std::filesystem::is_regular_file(arguments.fFile, ignored))
@@ -91,11 +89,11 @@ TBundleCheck CheckOrThrow(TArguments const& arguments) {
   }
 }
 
-int Verify(TArguments const& arguments) {
+int Verify(TVerifyArguments const& arguments) {
   TBundleCheck const check = CheckOrThrow(arguments);
   EExitStatus const status = check.IsRight() ? kExitComplete : kExitNothing;
   if (arguments.fAsJson)
-    WriteOutput(AsText(DocumentAbout(check, arguments, status)));
+    WriteOutput(zep::AsText(DocumentAbout(check, arguments, status)));
   else
     WriteMessage(TextAbout(check, arguments));
   return status;
@@ -104,7 +102,7 @@ int Verify(TArguments const& arguments) {
 }  // namespace
 
 TRun AddVerifyArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TVerifyArguments>();
   command.add_option("file", arguments->fFile, "The bundle, the output of zep report --bundle")->required();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   auto* const signer =

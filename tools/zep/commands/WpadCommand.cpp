@@ -28,7 +28,7 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
-struct TArguments {
+struct TWpadArguments {
   bool fAsJson = false;
   bool fIsConfirmed = false;
   bool fKeepsClients = false;
@@ -205,7 +205,7 @@ void Tell(TFindings const& findings, bool asJson) {
   if (!missing.empty()) std::cerr << "zep: " << Printable(missing) << "\n";
 }
 
-int Wpad(TArguments const& arguments) {
+int Wpad(TWpadArguments const& arguments) {
   std::string const whyNot = WhyNoListening();
   if (!whyNot.empty()) throw std::runtime_error(whyNot);
   if (!arguments.fKeepsClients && !StopClients(arguments.fIsConfirmed))
@@ -220,7 +220,7 @@ int Wpad(TArguments const& arguments) {
 }  // namespace
 
 TRun AddWpadArguments(CLI::App& command) {
-  auto const arguments = std::make_shared<TArguments>();
+  auto const arguments = std::make_shared<TWpadArguments>();
   command.add_flag("--json", arguments->fAsJson, "Print one JSON document");
   command.add_flag("--fetch", arguments->fFetches, "Also fetch the file, over plain HTTP with libcurl, and print it");
   AddSizeOption(command, "--max-file", arguments->fMostBytes,

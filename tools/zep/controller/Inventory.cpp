@@ -24,7 +24,7 @@ namespace NQRVZEP20::zep {
 namespace {
 
 constexpr char const* kProvider = "Controller";
-constexpr char kEnd = '\0';  // of the reason, which precedes the namespace
+constexpr char kEndOfReason = '\0';  // of the reason, which precedes the namespace
 
 // Of the session: when to stop, and whether a command was not answered by then.
 std::chrono::steady_clock::time_point gEnd;
@@ -95,13 +95,13 @@ TInventoryLimits TInventoryLimits::After(std::chrono::steady_clock::duration pas
 bool SendInventory(std::string const& host, TInventoryLimits const& limits, TSend const& send) {
   boost::shared_ptr<ICIMNamespace> ns;
   std::string const failure = FailureOf([&] { ns = ReadController(host, limits); });
-  send(failure + kEnd);
+  send(failure + kEndOfReason);
   if (ns) WriteNamespace(*ns, send);
   return !gIsWaiting;
 }
 
 TInventory InventoryFrom(std::string sent) {
-  std::size_t const end = sent.find(kEnd);
+  std::size_t const end = sent.find(kEndOfReason);
   if (end == std::string::npos) return {nullptr, "the process ended before it had read the inventory"};
   if (end > 0) return {nullptr, sent.substr(0, end)};
   TInventory inventory;

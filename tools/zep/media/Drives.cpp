@@ -23,7 +23,7 @@ fs::path PlaceOf(std::uint64_t number) {
   return fs::canonical("/sys/dev/block/" + TextOf(number), error);
 }
 
-bool IsPartition(fs::path const& place) {
+bool IsPartitionDirectory(fs::path const& place) {
   std::error_code error;
   return !place.empty() && fs::exists(place / "partition", error);
 }
@@ -37,7 +37,7 @@ void AddDrivesOf(fs::path const& place, TDrives& drives) {
     isVolume = true;
     AddDrivesOf(fs::canonical(slave->path(), error), drives);
   }
-  if (!isVolume) drives.insert(IsPartition(place) ? place.parent_path() : place);
+  if (!isVolume) drives.insert(IsPartitionDirectory(place) ? place.parent_path() : place);
 }
 
 void AddDrivesOf(std::uint64_t number, TDrives& drives) {
@@ -57,7 +57,7 @@ std::uint64_t NumberOf(std::string const& path) {
 
 bool IsPartitionOf(std::string const& partition, std::string const& device) {
   fs::path const place = PlaceOf(NumberOf(partition));
-  return IsPartition(place) && place.parent_path() == PlaceOf(NumberOf(device));
+  return IsPartitionDirectory(place) && place.parent_path() == PlaceOf(NumberOf(device));
 }
 
 TDrives DrivesOf(TMount const& mount) {

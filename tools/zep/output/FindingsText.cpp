@@ -16,7 +16,7 @@ using EOutcome = TRuleResult::EOutcome;
 constexpr std::size_t kIndent = 13;  // the width of "information" and two blanks
 
 // "2 errors"
-std::string Counted(std::size_t count, std::string const& severity) {
+std::string CountedProblems(std::size_t count, std::string const& severity) {
   bool const hasPlural = severity == "warning" || severity == "error";
   return std::to_string(count) + " " + severity + (hasPlural && count != 1 ? "s" : "");
 }
@@ -89,7 +89,7 @@ std::string CountsOf(std::vector<TStoredProblem> const& problems) {
   for (char const* severity : {"critical", "error", "warning", "information"}) {
     auto const count = std::count_if(problems.begin(), problems.end(),
                                      [&](TStoredProblem const& problem) { return problem.fSeverity == severity; });
-    if (count > 0) text += (text.empty() ? "" : ", ") + Counted(static_cast<std::size_t>(count), severity);
+    if (count > 0) text += (text.empty() ? "" : ", ") + CountedProblems(static_cast<std::size_t>(count), severity);
   }
   return text.empty() ? "nothing wrong" : text;
 }

@@ -11,7 +11,7 @@ namespace NQRVZEP20::zep {
 namespace {
 
 constexpr std::size_t kLineWidth = 80;
-constexpr std::size_t kGap = 2;  // between two columns of a table
+constexpr std::size_t kColumnGap = 2;  // between two columns of a table
 
 std::string CellText(TReportSection::TCell const& cell) {
   if (cell.IsKnown()) return *cell.fValue;
@@ -35,7 +35,7 @@ std::vector<std::size_t> WidthsFor(TRows const& rows) {
   std::vector<std::size_t> widths(rows.front().size());
   for (auto const& row : rows)
     for (std::size_t at = 0; at < row.size(); ++at) widths[at] = std::max(widths[at], WidthOf(row[at]));
-  std::size_t const room = kLineWidth - kGap * (widths.size() - 1);
+  std::size_t const room = kLineWidth - kColumnGap * (widths.size() - 1);
   while (std::accumulate(widths.begin(), widths.end(), std::size_t(0)) > room) --*std::max_element(widths.begin(), widths.end());
   return widths;
 }

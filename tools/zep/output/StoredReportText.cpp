@@ -46,7 +46,7 @@ std::string ProvidersAsText(std::string const& title, std::vector<TStoredProvide
   return table.GetText();
 }
 
-std::string InstanceAsText(TStoredInstance const& instance) {
+std::string StoredInstanceAsText(TStoredInstance const& instance) {
   TTable table({24, 10, 42});
   table.Add({"Property", "Type", "Value"});
   for (TStoredProperty const& property : instance.fProperties)
@@ -58,7 +58,7 @@ std::string InstanceAsText(TStoredInstance const& instance) {
 std::string InstancesAsText(std::vector<TStoredInstance> const& instances) {
   std::string text;
   for (TStoredInstance const& instance : instances)
-    if (instance.fClass != kMissingValueClass) text += "\n" + InstanceAsText(instance);
+    if (instance.fClass != kMissingValueClass) text += "\n" + StoredInstanceAsText(instance);
   return text;
 }
 

@@ -33,8 +33,8 @@ std::size_t BreakOf(std::string_view text, std::size_t width) {
 
 // ---- Columns ----
 
-constexpr std::size_t kGap = 2;         // between two columns
-constexpr std::size_t kLeastWidth = 6;  // of a column whose words are broken
+constexpr std::size_t kGap = 2;               // between two columns
+constexpr std::size_t kLeastColumnWidth = 6;  // of a column whose words are broken
 
 using TWidths = std::vector<std::size_t>;
 
@@ -138,7 +138,7 @@ void TTable::Add(std::vector<std::string> const& cells) {
 }
 
 std::vector<std::size_t> TTable::WidthsFor(ELayout layout, std::size_t lineWidth) const {
-  TWidths needed(fWidths.size()), whole(fWidths.size()), least(fWidths.size(), kLeastWidth);
+  TWidths needed(fWidths.size()), whole(fWidths.size()), least(fWidths.size(), kLeastColumnWidth);
   for (auto const& row : fRows)
     for (std::size_t at = 0; at < row.size(); ++at) {
       // A word of more than three quarters of the line is cut instead.

@@ -16,13 +16,13 @@ namespace {
 
 using TType = TCIMValue::TCIMType;
 
-TCIMContext const kNone;
+TCIMContext const kNoContext;
 constexpr std::size_t kWidth = 110;             // of the text of a comment
 constexpr std::size_t kMostWords = 6 * kWidth;  // of the list of values; the MOF file has the complete one
 
 std::string DescriptionOf(ICIMNamedElement const& element) {
-  auto const qualifier = element.GetQualifier("Description", kNone);
-  TCIMValue const value = qualifier ? qualifier->GetValue(kNone) : TCIMValue();
+  auto const qualifier = element.GetQualifier("Description", kNoContext);
+  TCIMValue const value = qualifier ? qualifier->GetValue(kNoContext) : TCIMValue();
   return value.IsNull() ? "" : value.ToString();
 }
 
@@ -53,11 +53,11 @@ std::string WordsOf(ICIMPropertyDecl const& property) {
 }
 
 std::string CommentOf(ICIMPropertyDecl const& property) {
-  TCIMValue const initial = property.GetDefaultValue(kNone);
+  TCIMValue const initial = property.GetDefaultValue(kNoContext);
   auto const referenced = initial.GetReferencedClass();
-  std::string heading = property.GetName(kNone) + ", " + NameOf(initial.GetType());
-  if (referenced) heading += " to " + referenced->GetName(kNone) + " (GetReference of another instance)";
-  if (property.IsKey(kNone)) heading += ", key";
+  std::string heading = property.GetName(kNoContext) + ", " + NameOf(initial.GetType());
+  if (referenced) heading += " to " + referenced->GetName(kNoContext) + " (GetReference of another instance)";
+  if (property.IsKey(kNoContext)) heading += ", key";
   std::string const sentence = FirstSentenceOf(DescriptionOf(property));
   std::string const words = WordsOf(property);
   return AsComment(heading + (sentence.empty() ? "" : ": " + sentence)) + (words.empty() ? "" : AsComment(words));
@@ -65,8 +65,8 @@ std::string CommentOf(ICIMPropertyDecl const& property) {
 
 // A value for a key. CIM names the class of an object in such a property.
 std::string ExampleFor(ICIMPropertyDecl const& key, std::string const& className) {
-  TType const type = key.GetDefaultValue(kNone).GetType();
-  bool const isClassName = IsSameName(key.GetName(kNone), "CreationClassName");
+  TType const type = key.GetDefaultValue(kNoContext).GetType();
+  bool const isClassName = IsSameName(key.GetName(kNoContext), "CreationClassName");
   switch (type) {
     case TType::kCIMTypeBoolean:
       return "true";
@@ -86,10 +86,10 @@ std::string ExampleFor(ICIMPropertyDecl const& key, std::string const& className
 }
 
 std::string LineFor(ICIMPropertyDecl const& property, std::string const& className) {
-  bool const isKey = property.IsKey(kNone);
-  TCIMValue const initial = property.GetDefaultValue(kNone);
+  bool const isKey = property.IsKey(kNoContext);
+  TCIMValue const initial = property.GetDefaultValue(kNoContext);
   std::string const value = isKey ? ExampleFor(property, className) : "TCIMValue()";
-  std::string const line = "values.Set(\"" + property.GetName(kNone) + "\", " + value + ");\n";
+  std::string const line = "values.Set(\"" + property.GetName(kNoContext) + "\", " + value + ");\n";
   return isKey || initial.IsNull() ? "  " + line
                                    : AsComment("It keeps its default, " + initial.ToString() + ", unless it is set.");
 }
@@ -97,15 +97,16 @@ std::string LineFor(ICIMPropertyDecl const& property, std::string const& classNa
 }  // namespace
 
 std::string ValueLinesOf(ICIMClass& cls) {
-  std::string const className = cls.GetName(kNone);
+  std::string const className = cls.GetName(kNoContext);
   std::string keys, others;
-  cls.CreateInstance(kNone)->EnumerateProperties(
-      [&](boost::shared_ptr<ICIMProperty> property) {
-        auto const declaration = property->GetDeclaration(kNone);
-        (declaration->IsKey(kNone) ? keys : others) += CommentOf(*declaration) + LineFor(*declaration, className);
-        return true;
-      },
-      kNone);
+  cls.CreateInstance(kNoContext)
+      ->EnumerateProperties(
+          [&](boost::shared_ptr<ICIMProperty> property) {
+            auto const declaration = property->GetDeclaration(kNoContext);
+            (declaration->IsKey(kNoContext) ? keys : others) += CommentOf(*declaration) + LineFor(*declaration, className);
+            return true;
+          },
+          kNoContext);
   return keys + others;
 }
 

@@ -4,6 +4,7 @@
 #include "core/Handles.h"
 #include "tools/zep/output/Text.h"
 #include "tools/zep/transfer/Download.h"
+#include "tools/zep/transfer/LocalFile.h"
 
 #include <fcntl.h>
 #include <linux/fs.h>
@@ -21,8 +22,6 @@ namespace NQRVZEP20::zep {
 namespace {
 
 namespace fs = std::filesystem;
-
-std::string ReasonOf(int error) { return std::generic_category().message(error); }
 
 bool MakeEmptyFile(std::string const& path) {
   TUniqueFd const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, kModeOfPart));

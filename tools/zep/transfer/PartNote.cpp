@@ -15,16 +15,16 @@ namespace NQRVZEP20::zep {
 namespace {
 
 constexpr char const* kFirstLine = "zep get: the part beside this file is the beginning of\n";
-constexpr std::size_t kMostBytes = 65536;
+constexpr std::size_t kMostBytesOfNote = 65536;
 
 std::string NameOfNote(std::string const& part) { return part + ".from"; }
 
-// The first kMostBytes of a regular file; empty if it cannot be read.
+// The first kMostBytesOfNote of a regular file; empty if it cannot be read.
 std::string BeginningOf(std::string const& path) {
   TUniqueFd const file(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC));
   struct stat status {};
   if (!file || ::fstat(file.get(), &status) != 0 || !S_ISREG(status.st_mode)) return "";
-  std::string text(kMostBytes, '\0');
+  std::string text(kMostBytesOfNote, '\0');
   std::size_t length = 0;
   for (ssize_t got = 1; got != 0 && length < text.size(); length += static_cast<std::size_t>(got)) {
     while ((got = ::read(file.get(), &text[length], text.size() - length)) < 0 && errno == EINTR) continue;

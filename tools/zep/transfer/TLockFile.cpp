@@ -2,6 +2,7 @@
 #include "tools/zep/transfer/TLockFile.h"
 
 #include "tools/zep/output/Text.h"
+#include "tools/zep/transfer/LocalFile.h"
 
 #include <fcntl.h>
 #include <sys/file.h>
@@ -9,18 +10,9 @@
 #include <unistd.h>
 
 #include <cerrno>
-#include <system_error>
 #include <utility>
 
 namespace NQRVZEP20::zep {
-
-namespace {
-
-std::string ReasonOf(int error) { return std::generic_category().message(error); }
-
-bool IsSameFile(struct stat const& a, struct stat const& b) { return a.st_dev == b.st_dev && a.st_ino == b.st_ino; }
-
-}  // namespace
 
 TLockFile::TLockFile(std::string path) : fPath(std::move(path)) {
   while (Open() && !IsStillThere()) fFile = TUniqueFd();  // the process that held the lock has just removed the file

@@ -11,6 +11,7 @@
 #include "tools/zep/processes/TChildProcess.h"
 #include "tools/zep/secrets/Secrets.h"
 #include "tools/zep/transfer/Download.h"
+#include "tools/zep/transfer/LocalFile.h"
 #include "tools/zep/transfer/PartFile.h"
 #include "tools/zep/transfer/PartNote.h"
 #include "tools/zep/transfer/Sha256.h"
@@ -42,8 +43,6 @@ namespace NQRVZEP20::zep {
 namespace {
 
 namespace fs = std::filesystem;
-
-std::string ReasonOf(int error) { return std::generic_category().message(error); }
 
 // ---- Progress ----
 
@@ -159,8 +158,6 @@ std::string WhyNoSize(std::string const& text, std::uint64_t& bytes) {
   bytes = number << shift;
   return "";
 }
-
-bool IsSameFile(struct stat const& a, struct stat const& b) { return a.st_dev == b.st_dev && a.st_ino == b.st_ino; }
 
 // ---- Sending ----
 

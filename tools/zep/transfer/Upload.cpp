@@ -54,7 +54,7 @@ std::size_t ReadSource(char* bytes, std::size_t size, std::size_t count, void* c
 }
 
 std::string DirectoryOf(std::string const& path) { return path.substr(0, path.rfind('/') + 1); }
-std::string NameIn(std::string const& path) { return path.substr(path.rfind('/') + 1); }
+std::string LastPartOf(std::string const& path) { return path.substr(path.rfind('/') + 1); }
 
 bool HasControlCharacter(std::string const& text) {
   for (unsigned char const c : text)
@@ -95,7 +95,7 @@ std::size_t EndTransfer(char const*, std::size_t size, std::size_t count, void*)
 // The place of an upload, and other names in its directory, in the form that the commands of the server need.
 class TNames {
 public:
-  explicit TNames(TRemote const& place) : fPlace(place), fName(Decoded(NameIn(place.fPath))), fDirectory(place) {
+  explicit TNames(TRemote const& place) : fPlace(place), fName(Decoded(LastPartOf(place.fPath))), fDirectory(place) {
     fDirectory.fPath = DirectoryOf(place.fPath);
   }
 
@@ -413,7 +413,7 @@ private:
 }  // namespace
 
 TUploadNames NamesForUpload(TRemote const& place) {
-  std::string const name = Decoded(NameIn(place.fPath));
+  std::string const name = Decoded(LastPartOf(place.fPath));
   return {TemporaryNameFor(name), TemporaryNameFor(name)};
 }
 
