@@ -4,7 +4,7 @@
 
 #include "fuzz/Require.h"
 #include "tools/zep/bundle/CheckBundle.h"
-#include "tools/zep/recording/Archive.h"
+#include "tools/zep/packing/Archive.h"
 
 #include <sys/mman.h>
 #include <unistd.h>

@@ -13,7 +13,7 @@ trap 'rm -rf "$work"' EXIT
 cmake --install "$build" --prefix "$work/prefix" >"$work/install.log"
 
 private=$(dirname "$(find "$work/prefix" -name libzepcore.so)")
-for file in libsmbios.so libipmiClient.so ovdusblan.so libHost.nsp.so libNetwork.nsp.so libStorage.nsp.so libDevices.nsp.so libSensors.nsp.so libController.nsp.so; do
+for file in libzep-packing.so libsmbios.so libipmiClient.so ovdusblan.so libHost.nsp.so libNetwork.nsp.so libStorage.nsp.so libDevices.nsp.so libSensors.nsp.so libController.nsp.so; do
   [[ -e $private/$file ]] || { echo "$file does not lie beside libzepcore.so" >&2; exit 1; }
 done
 

@@ -25,6 +25,10 @@ for name in Host Storage Network Devices Sensors; do holds "zep-provider-${name,
 holds libzepcore1 "libzepcore\.so\.1\.[0-9.]*"
 holds libzepcore1 "libzepcore\.so\.1 -> libzepcore\.so\.1\.[0-9.]*"
 holds libzepcore-dev "libzepcore\.so -> libzepcore\.so\.1"
+holds zep libzep-packing.so
+for name in libarchive13 libssl3; do  # loaded through it
+  dpkg-deb --field "$packages"/zep_*.deb Depends | grep -q "$name" || fail "zep does not depend on $name"
+done
 holds libzepcore-ipmi libController.nsp.so
 dpkg-deb --fsys-tarfile "$packages"/libzepcore-ipmi_*.deb | tar -xO ./usr/share/doc/libzepcore-ipmi/copyright >"$work/log"
 grep -q '^License: GPL-3.0-or-later$' "$work/log" || fail "libzepcore-ipmi does not state its licence:" "$work/log"

@@ -50,7 +50,7 @@ public:
     fs::create_directory(fDir.Path("lib"));
     fs::create_directory(fDir.Path("bin"));
     fs::copy(TEST_BIN_DIR "/zep", fDir.Path("bin/zep"));
-    for (char const* library : {"libzepcore.so", "libsmbios.so", "libHost.nsp.so"})
+    for (char const* library : {"libzepcore.so", "libzep-packing.so", "libsmbios.so", "libHost.nsp.so"})
       Add(library, std::string(TEST_LIB_DIR "/") + library);
     fs::create_directories(fDir.Path("share/zepcore"));
     fs::copy(TEST_SHARE_DIR "/zepcore", fDir.Path("share/zepcore"), fs::copy_options::recursive);

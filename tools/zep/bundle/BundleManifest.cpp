@@ -4,7 +4,7 @@
 #include "collect/SafeText.h"
 #include "collect/stored/StoredDocument.h"
 #include "tools/zep/output/Json.h"
-#include "tools/zep/recording/Archive.h"
+#include "tools/zep/packing/Archive.h"
 
 #include <set>
 

@@ -2,8 +2,8 @@
 #include "tools/zep/bundle/CheckBundle.h"
 
 #include "collect/SafeText.h"
-#include "tools/zep/recording/Archive.h"
-#include "tools/zep/transfer/Sha256.h"
+#include "tools/zep/packing/Archive.h"
+#include "tools/zep/packing/Checksum.h"
 
 #include <map>
 #include <set>
@@ -19,11 +19,11 @@ constexpr std::size_t kMostMembers = 100;
 class TBundleReading {
 public:
   TBundleReading(std::string const& file, TTrust const& trust)
-      : fVerifier(trust), fIsTrustWanted(trust.IsWanted()), fArchive(file) {}
+      : fVerifier(VerifierFor(trust)), fIsTrustWanted(trust.IsWanted()), fArchive(NewArchiveReader(file)) {}
 
   TBundleCheck Run() {
     ReadManifest();
-    while (auto const member = fArchive.Next()) {
+    while (auto const member = fArchive->Next()) {
       if (fSeen.size() == kMostMembers) throw TArchiveError("it has more than " + std::to_string(kMostMembers) + " members");
       Read(*member);
     }
@@ -34,10 +34,10 @@ public:
 
 private:
   void ReadManifest() {
-    auto const first = fArchive.Next();
+    auto const first = fArchive->Next();
     if (!first || first->fName != kManifestName || first->fKind != EMemberKind::kFile)
       throw TArchiveError(std::string("it is not a bundle: its first member is not ") + kManifestName);
-    fManifestText = fArchive.Content(kMostManifestBytes);
+    fManifestText = fArchive->Content(kMostManifestBytes);
     fCheck.fManifest = ManifestFrom(fManifestText);
     for (TBundledPiece const& piece : fCheck.fManifest.fPieces) fExpected.emplace(piece.fName, &piece);
     fSeen.insert(kManifestName);
@@ -52,7 +52,7 @@ private:
       Differ(member.fName, member.fKind == EMemberKind::kLink ? "it is a symbolic link" : "it is a directory");
       fExpected.erase(member.fName);
     } else if (member.fName == kSignatureName && fCheck.fManifest.fIsSigned) {
-      fSignature = fArchive.Content(kMostManifestBytes);
+      fSignature = fArchive->Content(kMostManifestBytes);
     } else if (auto const at = fExpected.find(member.fName); at != fExpected.end()) {
       Compare(*at->second);
       fExpected.erase(at);
@@ -63,22 +63,22 @@ private:
   }
 
   void Compare(TBundledPiece const& piece) {
-    TSha256 sum;
+    auto const sum = NewSha256();
     std::uint64_t bytes = 0;
-    fArchive.Read(MostBytesOf(piece.fName), [&](std::string_view part) {
-      sum.Add(part);
+    fArchive->Read(MostBytesOf(piece.fName), [&](std::string_view part) {
+      sum->Add(part);
       bytes += part.size();
     });
     if (bytes != piece.fBytes)
       Differ(piece.fName, "it has " + std::to_string(bytes) + " bytes instead of " + std::to_string(piece.fBytes));
-    else if (sum.Digits() != piece.fSha256)
+    else if (sum->Digits() != piece.fSha256)
       Differ(piece.fName, "its content was altered: its SHA-256 differs");
   }
 
   // The content must be unpacked to reach the next member.
   void Skip(std::string const& name) {
     std::uint64_t const most = MostBytesOf(name);
-    fArchive.Read(most != 0 ? most : kMostForeignBytes, [](std::string_view) {});
+    fArchive->Read(most != 0 ? most : kMostForeignBytes, [](std::string_view) {});
   }
 
   void CheckSignature() {
@@ -88,7 +88,7 @@ private:
     }
     if (fSeen.count(kSignatureName) == 0) return Differ(kSignatureName, "it is missing, and the manifest says that there is one");
     try {
-      fCheck.fSigner = fVerifier.Verify(fManifestText, fSignature);
+      fCheck.fSigner = fVerifier->Verify(fManifestText, fSignature);
     } catch (TSignatureError const& failure) {
       Differ(kSignatureName, failure.what());
     }
@@ -98,9 +98,9 @@ private:
     fCheck.fDifferences.push_back({Shortened(member, 1000), reason});
   }
 
-  TVerifier const fVerifier;
+  std::unique_ptr<TVerifier> const fVerifier;
   bool const fIsTrustWanted;
-  TArchiveReader fArchive;
+  std::unique_ptr<TArchiveReader> const fArchive;
   TBundleCheck fCheck;
   std::string fManifestText, fSignature;
   std::map<std::string, TBundledPiece const*> fExpected;

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/bundle/TBundle.h"
 
-#include "tools/zep/recording/Archive.h"
+#include "tools/zep/packing/Archive.h"
 #include "tools/zep/recording/RecordingIndex.h"
 #include "tools/zep/transfer/Sha256.h"
 
@@ -28,14 +28,14 @@ std::string TBundle::Pack(TSigner const* signer) {
   fManifest.fTime = TimeText(now);
   fManifest.fIsSigned = signer != nullptr;
   std::string const manifest = TextOf(fManifest);
-  TArchiveWriter archive;
+  auto const archive = NewArchiveWriter();
   auto const add = [&](std::string const& name, std::string const& content) {
-    archive.Add({EMemberKind::kFile, name, {}, 0600, {now, 0}}, content);
+    archive->Add({EMemberKind::kFile, name, {}, 0600, {now, 0}}, content);
   };
   add(kManifestName, manifest);
   if (signer != nullptr) add(kSignatureName, signer->Sign(manifest));
   for (std::size_t at = 0; at < fContents.size(); ++at) add(fManifest.fPieces[at].fName, fContents[at]);
-  return archive.Finish();
+  return archive->Finish();
 }
 
 }  // namespace NQRVZEP20::zep

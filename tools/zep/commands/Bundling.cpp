@@ -68,7 +68,7 @@ void AddBundleOptions(CLI::App& command, TBundleArguments& arguments) {
 }
 
 void CheckSigning(TBundleArguments const& arguments) {
-  if (!arguments.fKey.empty()) TSigner(arguments.fKey, arguments.fCertificate);
+  if (!arguments.fKey.empty()) SignerFrom(arguments.fKey, arguments.fCertificate);
 }
 
 // ---- The evidence ----
@@ -131,9 +131,9 @@ TBundleManifest WriteBundle(TBundleArguments const& arguments, std::string const
   if (evidence.fRecording) bundle.Add(kRecordingPiece, *evidence.fRecording, evidence.fRecordingMaking);
   if (evidence.fLog) bundle.Add(kLogPiece, *evidence.fLog, "the log of zep and its plug-ins, without passwords");
   for (TMissingPiece const& row : evidence.fMissing) bundle.AddMissing(row.fPiece, row.fReason);
-  std::optional<TSigner> signer;
-  if (!arguments.fKey.empty()) signer.emplace(arguments.fKey, arguments.fCertificate);
-  std::string const archive = bundle.Pack(signer ? &*signer : nullptr);
+  std::unique_ptr<TSigner> signer;
+  if (!arguments.fKey.empty()) signer = SignerFrom(arguments.fKey, arguments.fCertificate);
+  std::string const archive = bundle.Pack(signer.get());
   ThrowIfInterrupted();
   WritePrivateFile(arguments.fFile, archive);
   return bundle.Manifest();

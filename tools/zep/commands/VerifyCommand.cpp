@@ -8,7 +8,7 @@
 #include "tools/zep/output/Failure.h"
 #include "tools/zep/output/Json.h"
 #include "tools/zep/output/Output.h"
-#include "tools/zep/recording/Archive.h"
+#include "tools/zep/packing/Archive.h"
 #include "tools/zep/secrets/Secrets.h"
 
 #include <CLI/CLI.hpp>

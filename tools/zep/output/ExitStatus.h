@@ -16,7 +16,7 @@ enum EExitStatus {
   // For transfers, which end with kExitNothing if the server refuses them or they fail halfway:
   kExitNoInput = 66,       // the file to send cannot be read; also: a stored report is refused
   kExitNoConnection = 68,  // the host is unknown or does not answer
-  kExitNoLibrary = 69,     // libcurl is missing or unsuitable
+  kExitNoLibrary = 69,     // libcurl is missing or unsuitable; also: libzep-packing.so
   kExitNotWritten = 73,    // the local file exists already, or cannot be written; also: a page
   kExitStalled = 75,       // no data moved for too long
 

@@ -3,7 +3,7 @@
 
 #include "collect/findings/TThresholds.h"
 #include "tools/zep/output/Json.h"
-#include "tools/zep/recording/Archive.h"
+#include "tools/zep/packing/Archive.h"
 
 #include <cstdint>
 #include <string>

@@ -134,13 +134,13 @@ TRecorder::TResult TRecorder::Finish(std::vector<TPlugIn> const& plugIns, TThres
   NamePlugIns(index, root, plugIns);
   AddMembers(index, root);
   CheckSize(index);
-  TArchiveWriter archive;
-  archive.Add({EMemberKind::kFile, kIndexName, {}, 0600, {std::time(nullptr), 0}}, TextOf(index));
+  auto const archive = NewArchiveWriter();
+  archive->Add({EMemberKind::kFile, kIndexName, {}, 0600, {std::time(nullptr), 0}}, TextOf(index));
   for (TRecordedMember const& recorded : index.fMembers) {
     TMember const& member = recorded.fMember;
-    archive.Add(member, member.fKind == EMemberKind::kFile ? ContentOf(fDirectory.Path(member.fName)) : "");
+    archive->Add(member, member.fKind == EMemberKind::kFile ? ContentOf(fDirectory.Path(member.fName)) : "");
   }
-  result.fArchive = archive.Finish();
+  result.fArchive = archive->Finish();
   return result;
 }
 

@@ -37,12 +37,13 @@ constexpr mode_t kFileMode = 0400;
 // Unpacks the members one by one. Every directory is new and private, and links are made last, so that no name leads elsewhere.
 class TUnpacking {
 public:
-  TUnpacking(std::string const& file, std::string directory) : fArchive(file), fDirectory(std::move(directory)) {}
+  TUnpacking(std::string const& file, std::string directory)
+      : fArchive(NewArchiveReader(file)), fDirectory(std::move(directory)) {}
 
   TRecordingIndex Run() {
     TRecordingIndex index = ReadIndex();
     for (TRecordedMember const& recorded : index.fMembers) fExpected.emplace(recorded.fMember.fName, &recorded);
-    while (auto const member = fArchive.Next()) {
+    while (auto const member = fArchive->Next()) {
       ThrowIfInterrupted();
       Unpack(*member);
     }
@@ -54,10 +55,10 @@ public:
 
 private:
   TRecordingIndex ReadIndex() {
-    auto const first = fArchive.Next();
+    auto const first = fArchive->Next();
     if (!first || first->fName != kIndexName || first->fKind != EMemberKind::kFile)
       throw TArchiveError(std::string("it is not a recording: its first member is not ") + kIndexName);
-    return IndexFrom(fArchive.Content(kMostIndexBytes));
+    return IndexFrom(fArchive->Content(kMostIndexBytes));
   }
 
   void Unpack(TMember const& member) {
@@ -75,7 +76,7 @@ private:
   }
 
   void UnpackFile(TRecordedMember const& expected, std::string const& path) {
-    std::string const content = fArchive.Content(expected.fBytes);
+    std::string const content = fArchive->Content(expected.fBytes);
     {
       TUniqueFd const file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0600));
       mode_t const mode = expected.fMark.empty() ? kFileMode : kMarkMode & 07777;
@@ -98,7 +99,7 @@ private:
       throw TArchiveError("its link " + Printable(link.fName) + " leads out of the recording");
   }
 
-  TArchiveReader fArchive;
+  std::unique_ptr<TArchiveReader> const fArchive;
   std::string const fDirectory;
   std::map<std::string, TRecordedMember const*> fExpected;
   std::vector<TMember> fLinks;

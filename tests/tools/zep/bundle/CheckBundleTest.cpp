@@ -3,7 +3,7 @@
 
 #include "tests/tools/zep/bundle/Certificates.h"
 #include "tools/zep/bundle/TBundle.h"
-#include "tools/zep/recording/Archive.h"
+#include "tools/zep/packing/Archive.h"
 
 #include <gmock/gmock.h>
 
@@ -25,9 +25,9 @@ struct TPart {
 using TParts = std::vector<TPart>;
 
 std::string Packed(TParts const& parts) {
-  TArchiveWriter archive;
-  for (TPart const& part : parts) archive.Add(part.fMember, part.fContent);
-  return archive.Finish();
+  auto const archive = NewArchiveWriter();
+  for (TPart const& part : parts) archive->Add(part.fMember, part.fContent);
+  return archive->Finish();
 }
 
 TPart File(std::string const& name, std::string const& content) { return {{EMemberKind::kFile, name, {}, 0600}, content}; }
@@ -49,9 +49,9 @@ protected:
 
   // The members: manifest.json, of a signed bundle manifest.p7s, report.json, log/zep.log.
   TParts PartsOf(std::string const& bytes) {
-    TArchiveReader archive(Write(bytes));
+    auto const archive = NewArchiveReader(Write(bytes));
     TParts parts;
-    while (auto const member = archive.Next()) parts.push_back({*member, archive.Content(1 << 20)});
+    while (auto const member = archive->Next()) parts.push_back({*member, archive->Content(1 << 20)});
     return parts;
   }
 
@@ -75,7 +75,7 @@ protected:
 
   TTempDir fDir;
   TIdentity fAlice{fDir, "alice"}, fMallory{fDir, "mallory"};
-  TSigner fSigner{fAlice.fKeyFile, fAlice.fCertificateFile};
+  std::unique_ptr<TSigner> const fSigner = SignerFrom(fAlice.fKeyFile, fAlice.fCertificateFile);
   TTrust const fTrust{fAlice.fCertificateFile, ""};
 };
 
@@ -86,7 +86,7 @@ TEST_F(CheckBundleTest, AGoodBundleIsRight) {
   ASSERT_EQ(check.fManifest.fPieces.size(), 2u);
   EXPECT_EQ(check.fManifest.fPieces[0].fBytes, 7u);
   EXPECT_EQ(check.fManifest.fMissing[0].fReason, "for a test");
-  TBundleCheck const trusted = Check(Good(&fSigner), fTrust);
+  TBundleCheck const trusted = Check(Good(fSigner.get()), fTrust);
   EXPECT_TRUE(trusted.IsRight());
   EXPECT_EQ(trusted.fSigner, "CN=alice");
 }
@@ -131,7 +131,7 @@ TEST_F(CheckBundleTest, EachDifferenceIsNamed) {
 }
 
 TEST_F(CheckBundleTest, ASignatureThatDoesNotHoldIsNamed) {
-  TParts const good = PartsOf(Good(&fSigner));
+  TParts const good = PartsOf(Good(fSigner.get()));
   TParts parts = good;
   parts[0].fContent.replace(parts[0].fContent.find("for a test"), 3, "FOR");
   EXPECT_THAT(Differences(Packed(parts)), ElementsAre(StartsWith("manifest.p7s: it is not a signature of this manifest (")));
@@ -139,7 +139,7 @@ TEST_F(CheckBundleTest, ASignatureThatDoesNotHoldIsNamed) {
   parts[1].fContent = "x";
   EXPECT_THAT(Differences(Packed(parts)), ElementsAre(StartsWith("manifest.p7s: it is not a signature of this manifest (")));
   parts = good;
-  parts[1].fContent = TSigner(fMallory.fKeyFile, fMallory.fCertificateFile).Sign(parts[0].fContent);
+  parts[1].fContent = SignerFrom(fMallory.fKeyFile, fMallory.fCertificateFile)->Sign(parts[0].fContent);
   EXPECT_THAT(Differences(Packed(parts)), IsEmpty());
   EXPECT_THAT(Differences(Packed(parts), fTrust),
               ElementsAre("manifest.p7s: it is of another signer than the one that is trusted"));

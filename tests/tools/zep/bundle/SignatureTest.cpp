@@ -19,13 +19,13 @@ using testing::StartsWith;
 class SignatureTest : public testing::Test {
 protected:
   std::string SignedBy(TIdentity const& signer, std::string const& text = "text") {
-    return TSigner(signer.fKeyFile, signer.fCertificateFile).Sign(text);
+    return SignerFrom(signer.fKeyFile, signer.fCertificateFile)->Sign(text);
   }
 
   // Why the signature of "text" is refused; empty if it is not.
   static std::string WhyRefused(std::string const& signature, TTrust const& trust = {}, std::string const& text = "text") {
     try {
-      TVerifier(trust).Verify(text, signature);
+      VerifierFor(trust)->Verify(text, signature);
       return "";
     } catch (TSignatureError const& failure) {
       return failure.what();
@@ -35,7 +35,7 @@ protected:
   // Why no signer can be made of the files.
   static std::string WhyNoSigner(std::string const& key, std::string const& certificate = "") {
     try {
-      TSigner const signer(key, certificate);
+      SignerFrom(key, certificate);
       return "";
     } catch (TFailure const& failure) {
       EXPECT_EQ(failure.fStatus, kExitNoInput);
@@ -45,7 +45,7 @@ protected:
 
   static std::string WhyNoVerifier(TTrust const& trust) {
     try {
-      TVerifier const verifier(trust);
+      VerifierFor(trust);
       return "";
     } catch (TFailure const& failure) {
       EXPECT_EQ(failure.fStatus, kExitNoInput);
@@ -59,10 +59,10 @@ protected:
 
 TEST_F(SignatureTest, TheSignerIsNamedAndTrustedByCertificateOrAuthority) {
   std::string const signature = SignedBy(fAlice);
-  EXPECT_EQ(TVerifier({}).Verify("text", signature), "CN=alice");
-  EXPECT_EQ(TVerifier({fAlice.fCertificateFile, ""}).Verify("text", signature), "CN=alice");
-  EXPECT_EQ(TVerifier({"", fCa.fCertificateFile}).Verify("text", signature), "CN=alice");
-  EXPECT_EQ(TVerifier({"", fAlice.fCertificateFile}).Verify("text", signature), "CN=alice");
+  EXPECT_EQ(VerifierFor({})->Verify("text", signature), "CN=alice");
+  EXPECT_EQ(VerifierFor({fAlice.fCertificateFile, ""})->Verify("text", signature), "CN=alice");
+  EXPECT_EQ(VerifierFor({"", fCa.fCertificateFile})->Verify("text", signature), "CN=alice");
+  EXPECT_EQ(VerifierFor({"", fAlice.fCertificateFile})->Verify("text", signature), "CN=alice");
 }
 
 TEST_F(SignatureTest, AnotherSignerIsNotTrusted) {
@@ -128,14 +128,14 @@ TEST_F(SignatureTest, OpenSslVerifiesIt) {
 TEST_F(SignatureTest, OneFileMayHaveKeyAndCertificate) {
   WriteFile(fDir.Path("both"), ReadFile(fAlice.fCertificateFile) + ReadFile(fAlice.fKeyFile));
   std::filesystem::permissions(fDir.Path("both"), std::filesystem::perms(0600));
-  EXPECT_EQ(TVerifier({fAlice.fCertificateFile, ""}).Verify("x", TSigner(fDir.Path("both"), "").Sign("x")), "CN=alice");
+  EXPECT_EQ(VerifierFor({fAlice.fCertificateFile, ""})->Verify("x", SignerFrom(fDir.Path("both"), "")->Sign("x")), "CN=alice");
 }
 
 TEST_F(SignatureTest, AnIntermediateCertificateTravelsWithTheSignature) {
   TIdentity const middle(fDir, "middle", 100, &fCa, true), below(fDir, "below", 100, &middle);
   EXPECT_THAT(WhyRefused(SignedBy(below), {"", fCa.fCertificateFile}), HasSubstr("unable to get local issuer certificate"));
   WriteFile(fDir.Path("chain"), ReadFile(below.fCertificateFile) + ReadFile(middle.fCertificateFile));
-  std::string const signature = TSigner(below.fKeyFile, fDir.Path("chain")).Sign("text");
+  std::string const signature = SignerFrom(below.fKeyFile, fDir.Path("chain"))->Sign("text");
   EXPECT_EQ(WhyRefused(signature, {"", fCa.fCertificateFile}), "");
   EXPECT_EQ(WhyRefused(signature, {"", middle.fCertificateFile}), "");
 }

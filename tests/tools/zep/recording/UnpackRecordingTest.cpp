@@ -45,10 +45,10 @@ TRecorded GoodRecording() {
 }
 
 std::string Packed(std::string const& index, std::vector<TPart> const& parts) {
-  TArchiveWriter archive;
-  archive.Add({EMemberKind::kFile, kIndexName, {}, 0600}, index);
-  for (TPart const& part : parts) archive.Add(part.fMember, part.fContent);
-  return archive.Finish();
+  auto const archive = NewArchiveWriter();
+  archive->Add({EMemberKind::kFile, kIndexName, {}, 0600}, index);
+  for (TPart const& part : parts) archive->Add(part.fMember, part.fContent);
+  return archive->Finish();
 }
 std::string Packed(TRecorded const& recorded) { return Packed(TextOf(recorded.fIndex), recorded.fParts); }
 

@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "tools/zep/recording/Archive.h"
+#include "tools/zep/packing/Archive.h"
 
 #include "collect/SafeText.h"
 
+#include <archive.h>
 #include <archive_entry.h>
 
 #include <cerrno>
@@ -50,9 +51,33 @@ void Check(archive* of, bool isGood) {
   if (!isGood) throw std::runtime_error("libarchive: " + TextOf(archive_error_string(of)));
 }
 
-}  // namespace
+class TTarWriter : public TArchiveWriter {
+public:
+  TTarWriter();
+  void Add(TMember const& member, std::string const& content) override;
+  std::string Finish() override;
 
-TArchiveWriter::TArchiveWriter() : fArchive(archive_write_new(), archive_write_free) {
+private:
+  std::unique_ptr<archive, int (*)(archive*)> fArchive;
+  std::string fBytes;
+};
+
+class TTarReader : public TArchiveReader {
+public:
+  explicit TTarReader(std::string const& file);
+  std::optional<TMember> Next() override;
+  std::string Content(std::uint64_t limit) override;
+  void Read(std::uint64_t limit, std::function<void(std::string_view)> const& use) override;
+
+private:
+  [[noreturn]] void Throw(std::string const& where) const;
+
+  std::unique_ptr<archive, int (*)(archive*)> fArchive;
+  std::string fName;        // of the current member
+  std::uint64_t fSize = 0;  // of its content, as its header says
+};
+
+TTarWriter::TTarWriter() : fArchive(archive_write_new(), archive_write_free) {
   if (!fArchive) throw std::bad_alloc();
   archive* const of = fArchive.get();
   // A pax archive could only have names in the character set of the locale; zep runs in the locale "C".
@@ -61,7 +86,7 @@ TArchiveWriter::TArchiveWriter() : fArchive(archive_write_new(), archive_write_f
                 archive_write_open(of, &fBytes, nullptr, Append, nullptr) == ARCHIVE_OK);
 }
 
-void TArchiveWriter::Add(TMember const& member, std::string const& content) {
+void TTarWriter::Add(TMember const& member, std::string const& content) {
   std::unique_ptr<archive_entry, void (*)(archive_entry*)> const entry(archive_entry_new(), archive_entry_free);
   if (!entry) throw std::bad_alloc();
   archive_entry_set_pathname(entry.get(), member.fName.c_str());
@@ -75,12 +100,12 @@ void TArchiveWriter::Add(TMember const& member, std::string const& content) {
   Check(fArchive.get(), written == static_cast<la_ssize_t>(content.size()));
 }
 
-std::string TArchiveWriter::Finish() {
+std::string TTarWriter::Finish() {
   Check(fArchive.get(), archive_write_close(fArchive.get()) == ARCHIVE_OK);
   return std::move(fBytes);
 }
 
-TArchiveReader::TArchiveReader(std::string const& file) : fArchive(archive_read_new(), archive_read_free) {
+TTarReader::TTarReader(std::string const& file) : fArchive(archive_read_new(), archive_read_free) {
   if (!fArchive) throw std::bad_alloc();
   archive* const of = fArchive.get();
   archive_read_support_filter_zstd(of);
@@ -88,7 +113,7 @@ TArchiveReader::TArchiveReader(std::string const& file) : fArchive(archive_read_
   if (archive_read_open_filename(of, file.c_str(), kBlock) != ARCHIVE_OK) Throw("");
 }
 
-std::optional<TMember> TArchiveReader::Next() {
+std::optional<TMember> TTarReader::Next() {
   archive_entry* entry = nullptr;
   int const status = archive_read_next_header(fArchive.get(), &entry);
   if (status == ARCHIVE_EOF) return std::nullopt;
@@ -101,13 +126,13 @@ std::optional<TMember> TArchiveReader::Next() {
   return TMember{kind, fName, TextOf(archive_entry_symlink(entry)), archive_entry_perm(entry), {}};
 }
 
-std::string TArchiveReader::Content(std::uint64_t limit) {
+std::string TTarReader::Content(std::uint64_t limit) {
   std::string content;
   Read(limit, [&](std::string_view piece) { content += piece; });
   return content;
 }
 
-void TArchiveReader::Read(std::uint64_t limit, std::function<void(std::string_view)> const& use) {
+void TTarReader::Read(std::uint64_t limit, std::function<void(std::string_view)> const& use) {
   std::uint64_t bytes = 0;
   char buffer[kBlock];
   for (;;) {
@@ -122,9 +147,14 @@ void TArchiveReader::Read(std::uint64_t limit, std::function<void(std::string_vi
   if (bytes != fSize) throw TArchiveError("its member " + Printable(fName) + " has a hole at its end");
 }
 
-void TArchiveReader::Throw(std::string const& where) const {
+void TTarReader::Throw(std::string const& where) const {
   throw TArchiveError("it is cut, damaged or not a zstd-compressed tar archive" + where + ": " +
                       TextOf(archive_error_string(fArchive.get())));
 }
+
+}  // namespace
+
+std::unique_ptr<TArchiveWriter> NewArchiveWriter() { return std::make_unique<TTarWriter>(); }
+std::unique_ptr<TArchiveReader> NewArchiveReader(std::string const& file) { return std::make_unique<TTarReader>(file); }
 
 }  // namespace NQRVZEP20::zep

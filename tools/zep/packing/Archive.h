@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include <archive.h>
-
 #include <sys/types.h>
 #include <cstdint>
 #include <ctime>
@@ -12,8 +10,6 @@
 #include <stdexcept>
 #include <string>
 #include <string_view>
-
-struct archive_entry;
 
 namespace NQRVZEP20::zep {
 
@@ -32,16 +28,12 @@ struct TMember {
 // Compresses an archive into memory. Every operation throws std::runtime_error if libarchive fails.
 class TArchiveWriter {
 public:
-  TArchiveWriter();
+  virtual ~TArchiveWriter() = default;
 
-  void Add(TMember const& member, std::string const& content = "");
+  virtual void Add(TMember const& member, std::string const& content) = 0;
 
   // The complete archive. Call it once, at the end.
-  std::string Finish();
-
-private:
-  std::unique_ptr<archive, int (*)(archive*)> fArchive;
-  std::string fBytes;
+  virtual std::string Finish() = 0;
 };
 
 // Why an archive is refused: a clause that names the member.
@@ -53,24 +45,21 @@ struct TArchiveError : std::runtime_error {
 // memory is used than the caller allows. Every operation throws TArchiveError.
 class TArchiveReader {
 public:
-  explicit TArchiveReader(std::string const& file);
+  virtual ~TArchiveReader() = default;
 
   // The next member; none at the end. A member of another kind, such as a device or a hard link, is an error.
-  std::optional<TMember> Next();
+  virtual std::optional<TMember> Next() = 0;
 
   // The content of the current member, which is an error if it is longer than `limit` bytes, or has a hole at its end, which
   // programs that unpack the archive would fill.
-  std::string Content(std::uint64_t limit);
+  virtual std::string Content(std::uint64_t limit) = 0;
 
   // The same, passed to `use` piece by piece.
-  void Read(std::uint64_t limit, std::function<void(std::string_view piece)> const& use);
-
-private:
-  [[noreturn]] void Throw(std::string const& where) const;
-
-  std::unique_ptr<archive, int (*)(archive*)> fArchive;
-  std::string fName;        // of the current member
-  std::uint64_t fSize = 0;  // of its content, as its header says
+  virtual void Read(std::uint64_t limit, std::function<void(std::string_view piece)> const& use) = 0;
 };
+
+// Never null.
+std::unique_ptr<TArchiveWriter> NewArchiveWriter();
+std::unique_ptr<TArchiveReader> NewArchiveReader(std::string const& file);
 
 }  // namespace NQRVZEP20::zep
