@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "collect/stored/TJsonTree.h"
+
 #include <nlohmann/json.hpp>
 
 #include <cstddef>
@@ -17,8 +19,9 @@ struct TJsonBounds {
   std::size_t fMostComparisons = 200000000;
 };
 
-// Parses the text up to the first place that is beyond the bounds, and throws TStoredReportError there. Throws
+// Both parse the text up to the first place that is beyond the bounds, and throw TStoredReportError there. They throw
 // nlohmann::ordered_json::exception if the text is not JSON.
 nlohmann::ordered_json BoundedJson(std::string_view text, TJsonBounds const& bounds);
+TJsonTree BoundedTree(std::string_view text, TJsonBounds const& bounds);
 
 }  // namespace NQRVZEP20

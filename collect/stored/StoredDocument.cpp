@@ -32,11 +32,11 @@ bool IsLines(std::string const& text) {
   return first.is_object() && first.contains("document") && !first.contains("instances");
 }
 
-TJson Parsed(std::string const& text) {
+TJsonTree Parsed(std::string const& text) {
   constexpr std::string_view gzip = "\x1f\x8b";
   if (text.compare(0, gzip.size(), gzip) == 0) throw TStoredReportError("it is compressed; gunzip it first");
   try {
-    return BoundedJson(text, kDocumentBounds);
+    return BoundedTree(text, kDocumentBounds);
   } catch (TJson::exception const& failure) {
     throw TStoredReportError(IsLines(text) ? kLines : WhyNotJson(failure));
   }
@@ -47,10 +47,10 @@ void CheckHead(TStoredNode const& document) {
   if (!name || !name->IsString() || name->Text() != "zep report")
     throw TStoredReportError("it is not a document of zep report --json");
   TStoredNode const version = document.Member("version");
-  if (!version.Json().is_number_unsigned()) version.Refuse("is not a number");
-  auto const number = version.Json().get<std::uint64_t>();
+  if (version.Kind() != TStoredNode::EKind::kInteger || version.Number() < 0) version.Refuse("is not a number");
+  double const number = version.Number();
   if (number != kStoredVersion)
-    version.Refuse("is " + std::to_string(number) +
+    version.Refuse("is " + version.ScalarText() +
                    (number > kStoredVersion ? ", which a newer zep wrote" : ", which an older zep wrote") +
                    "; this zep reads version " + std::to_string(kStoredVersion));
   if (!document.Optional("status")) throw TStoredReportError("it has no report: " + document.TextOrNullOf("reason"));
@@ -92,12 +92,17 @@ TStoredDocument ParsedWithinBounds(std::string_view text, TJsonBounds const& bou
   }
 }
 
-TStoredDocument StoredDocumentFrom(std::string const& text, std::string const& name) {
+TJsonTree StoredTreeFrom(std::string const& text, std::string const& name) {
   return WithName(name, [&] {
-    TStoredDocument document = Parsed(text);
+    TJsonTree document = Parsed(text);
     CheckHead(TStoredNode(document));
     return document;
   });
+}
+
+TStoredDocument StoredDocumentFrom(std::string const& text, std::string const& name) {
+  StoredReportFrom(text, name);
+  return TStoredDocument::parse(text);
 }
 
 std::string ReadStoredText(std::string const& file) {
@@ -105,5 +110,9 @@ std::string ReadStoredText(std::string const& file) {
 }
 
 TStoredDocument ReadStoredDocument(std::string const& file) { return StoredDocumentFrom(ReadStoredText(file), file); }
+
+TStoredReport StoredReportOf(TStoredDocument const& document, std::string const& name) {
+  return StoredReportFrom(document.dump(-1, ' ', false, TJson::error_handler_t::replace), name);
+}
 
 }  // namespace NQRVZEP20

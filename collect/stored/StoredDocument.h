@@ -3,6 +3,7 @@
 
 #include "collect/stored/BoundedJson.h"
 #include "collect/stored/StoredReport.h"
+#include "collect/stored/TJsonTree.h"
 
 #include <nlohmann/json.hpp>
 
@@ -23,8 +24,10 @@ constexpr TJsonBounds kDocumentBounds{16, 2000, 8000000};
 // Parses a JSON document. Throws TStoredReportError if it is none, or beyond the bounds.
 TStoredDocument ParsedWithinBounds(std::string_view text, TJsonBounds const& bounds = kDocumentBounds);
 
-// Parses a document and checks that it is one of a report, in that version; its parts are checked by StoredReportOf. Throws
-// TStoredReportError.
+// Parses a document and checks that it is one of a report, in that version. Throws TStoredReportError.
+TJsonTree StoredTreeFrom(std::string const& text, std::string const& name);
+
+// The same as an object that can be changed. All parts of the document are checked, too (StoredReportFrom).
 TStoredDocument StoredDocumentFrom(std::string const& text, std::string const& name);
 
 // The text of a regular file of no more than kStoredReportLimit bytes. Throws TStoredReportError.
@@ -33,7 +36,7 @@ std::string ReadStoredText(std::string const& file);
 // The document in such a file.
 TStoredDocument ReadStoredDocument(std::string const& file);
 
-// The report of a document. Throws TStoredReportError if a part of it is missing or of another kind.
+// The report of a document that was changed. Throws TStoredReportError if a part of it is missing or of another kind.
 TStoredReport StoredReportOf(TStoredDocument const& document, std::string const& name);
 
 }  // namespace NQRVZEP20

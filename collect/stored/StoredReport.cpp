@@ -14,7 +14,6 @@ namespace NQRVZEP20 {
 
 namespace {
 
-using TJson = TStoredNode::TJson;
 using TText = TAnswer<std::string>;
 
 // ---- The parts of the document ----
@@ -90,30 +89,34 @@ std::string ShortestOf(float number) {
 
 // A value that is not an array, as text. A real32 is written in the document with the digits of a real64.
 std::string TextOf(TStoredNode const& node, std::string const& type) {
-  TJson const& json = node.Json();
-  if (json.is_structured()) node.Refuse("is not a value");
-  if (json.is_number_float() && type.rfind("real32", 0) == 0) return ShortestOf(json.get<float>());
-  return json.is_string() ? json.get<std::string>() : json.dump();
+  if (node.IsArray() || node.IsObject()) node.Refuse("is not a value");
+  bool const isReal32 = node.Kind() == TStoredNode::EKind::kFloat && type.rfind("real32", 0) == 0;
+  return isReal32 ? ShortestOf(static_cast<float>(node.Number())) : node.ScalarText();
 }
 
 // The word for the value, or the value with its unit.
-std::string InWords(TStoredNode const& value, TJson const* word, TStoredProperty const& property) {
-  std::string const text = TextOf(value, property.fType);
-  std::string const& unit = property.fUnit;
-  if (word != nullptr && word->is_string()) return word->get<std::string>();
-  return unit.empty() ? text : TextWithUnit(TCIMValue(text), unit);
+std::string InWords(TStoredNode const& value, TStoredNode const* word, TStoredProperty const& property) {
+  std::string text = TextOf(value, property.fType);
+  if (word != nullptr && word->IsString()) return word->Text();
+  return property.fUnit.empty() ? text : TextWithUnit(TCIMValue(text), property.fUnit);
 }
 
-std::string InWords(TStoredNode const& value, std::optional<TStoredNode> const& words, TStoredProperty const& property) {
-  if (!value.IsArray()) return InWords(value, words ? &words->Json() : nullptr, property);
+// The same for an array and its words, of which there may be fewer.
+std::string InWords(TStoredNode const& values, std::vector<TStoredNode> const& words, TStoredProperty const& property) {
   std::string text;
   std::size_t at = 0;
-  value.ForEachElement([&](TStoredNode const& element) {
-    bool const hasWord = words && words->IsArray() && at < words->Json().size();
-    text += (at == 0 ? "" : ", ") + InWords(element, hasWord ? &words->Json()[at] : nullptr, property);
+  values.ForEachElement([&](TStoredNode const& value) {
+    text += (at == 0 ? "" : ", ") + InWords(value, at < words.size() ? &words[at] : nullptr, property);
     ++at;
   });
   return text;
+}
+
+std::string InWords(TStoredNode const& value, std::optional<TStoredNode> const& words, TStoredProperty const& property) {
+  if (!value.IsArray()) return InWords(value, words ? &*words : nullptr, property);
+  bool const hasWords = words && words->IsArray();
+  return InWords(value, hasWords ? words->Elements([](TStoredNode const& word) { return word; }) : std::vector<TStoredNode>(),
+                 property);
 }
 
 TStoredProperty PropertyOf(TStoredNode const& node) {
@@ -126,16 +129,15 @@ TStoredProperty PropertyOf(TStoredNode const& node) {
     return property;
   }
   property.fText = InWords(value, node.Optional("words"), property);
-  property.fRaw =
-      value.IsArray() ? value.Json().dump(-1, ' ', false, TJson::error_handler_t::replace) : TextOf(value, property.fType);
+  property.fRaw = value.IsArray() ? value.AsJson() : TextOf(value, property.fType);
   return property;
 }
 
 TStoredInstance InstanceOf(TStoredNode const& node) {
   TStoredInstance instance{node.TextOf("path"), node.TextOf("provider"), node.TextOf("namespace"), node.TextOf("class"), {}};
-  TStoredNode const properties = node.Member("properties");
-  instance.fProperties.reserve(properties.Json().size());
-  properties.ForEachMember([&](TStoredNode const& property) { instance.fProperties.push_back(PropertyOf(property)); });
+  node.Member("properties").ForEachMember([&](TStoredNode const& property) {
+    instance.fProperties.push_back(PropertyOf(property));
+  });
   return instance;
 }
 
@@ -153,7 +155,7 @@ TStoredReport ReportOf(TStoredNode const& document) {
   if (auto const time = document.Optional("time")) report.fTime = time->Text();
   report.fStatus = document.TextOf("status");
   report.fReason = document.TextOrNullOf("reason");
-  if (auto const redaction = document.Optional("redaction")) report.fRedaction = redaction->Json().dump();
+  if (auto const redaction = document.Optional("redaction")) report.fRedaction = redaction->AsJson();
   report.fHead = document.Member("head").Elements([](TStoredNode const& line) { return line.Text(); });
   TStoredNode const findings = document.Member("findings");
   report.fProblems = findings.Member("problems").Elements(ProblemOf);
@@ -185,7 +187,8 @@ bool TStoredInstance::IsAssociation() const {
   return hasKey;
 }
 
-TStoredReport StoredReportOf(TStoredDocument const& document, std::string const& name) {
+TStoredReport StoredReportFrom(std::string const& text, std::string const& name) {
+  TJsonTree const document = StoredTreeFrom(text, name);
   try {
     TStoredReport report = ReportOf(TStoredNode(document));
     report.fFile = name;
@@ -195,10 +198,6 @@ TStoredReport StoredReportOf(TStoredDocument const& document, std::string const&
   }
 }
 
-TStoredReport StoredReportFrom(std::string const& text, std::string const& name) {
-  return StoredReportOf(StoredDocumentFrom(text, name), name);
-}
-
-TStoredReport ReadStoredReport(std::string const& file) { return StoredReportOf(ReadStoredDocument(file), file); }
+TStoredReport ReadStoredReport(std::string const& file) { return StoredReportFrom(ReadStoredText(file), file); }
 
 }  // namespace NQRVZEP20

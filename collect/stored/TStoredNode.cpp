@@ -4,31 +4,62 @@
 #include "collect/SafeText.h"
 #include "collect/stored/StoredReport.h"
 
+#include <nlohmann/json.hpp>
+
+#include <charconv>
+
 namespace NQRVZEP20 {
 
-TStoredNode TStoredNode::Member(char const* name) const {
+namespace {
+
+using TJson = nlohmann::json;
+
+std::string Quoted(std::string const& text) { return TJson(text).dump(-1, ' ', false, TJson::error_handler_t::replace); }
+
+}  // namespace
+
+TStoredNode TStoredNode::Member(std::string_view name) const {
   auto const member = Optional(name);
-  if (!member) Refuse(std::string("has no member \"") + name + "\"");
+  if (!member) Refuse("has no member \"" + std::string(name) + "\"");
   return *member;
 }
 
-std::optional<TStoredNode> TStoredNode::Optional(char const* name) const {
-  if (!fJson.is_object()) Refuse("is not an object");
-  auto const found = fJson.find(name);
-  if (found == fJson.end()) return std::nullopt;
-  return TStoredNode(*found, *this, name);
+std::optional<TStoredNode> TStoredNode::Optional(std::string_view name) const {
+  std::optional<std::size_t> found;
+  if (!IsObject()) Refuse("is not an object");
+  for (std::size_t at = fAt + 1; at < fDocument.EndOf(fAt); at = fDocument.EndOf(at))
+    if (fDocument.NameOf(at) == name) found = at;
+  return found ? std::optional(TStoredNode(*this, *found, 0)) : std::nullopt;
+}
+
+std::string TStoredNode::Name() const {
+  bool const isElement = fParent != nullptr && fParent->IsArray();
+  return isElement ? std::to_string(fNumber) : std::string(fDocument.NameOf(fAt));
 }
 
 std::string TStoredNode::Text() const {
-  if (!fJson.is_string()) Refuse("is not a string");
-  return fJson.get<std::string>();
+  if (!IsString()) Refuse("is not a string");
+  return ScalarText();
 }
 
-std::string TStoredNode::TextOrNull() const { return fJson.is_null() ? "" : Text(); }
+std::string TStoredNode::TextOrNull() const { return IsNull() ? "" : Text(); }
 
 double TStoredNode::Number() const {
-  if (!fJson.is_number()) Refuse("is not a number");
-  return fJson.get<double>();
+  if (Kind() != EKind::kInteger && Kind() != EKind::kFloat) Refuse("is not a number");
+  std::string_view const text = fDocument.TextOf(fAt);
+  double number = 0;
+  std::from_chars(text.data(), text.data() + text.size(), number);
+  return number;
+}
+
+std::string TStoredNode::AsJson() const {
+  if (IsString()) return Quoted(ScalarText());
+  if (!IsArray() && !IsObject()) return ScalarText();
+  std::string text;
+  ForEach([&](TStoredNode const& node) {
+    text += (text.empty() ? "" : ",") + (IsObject() ? Quoted(node.Name()) + ":" : "") + node.AsJson();
+  });
+  return IsArray() ? "[" + text + "]" : "{" + text + "}";
 }
 
 void TStoredNode::Refuse(std::string const& why) const {

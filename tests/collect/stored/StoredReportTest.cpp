@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "collect/stored/StoredReport.h"
 
+#include "collect/stored/StoredDocument.h"
 #include "tests/Support.h"
 #include "tests/collect/stored/StoredDocument.h"
 
@@ -94,6 +95,18 @@ TEST(StoredReportTest, AnInstanceWhoseKeysAreReferencesIsAnAssociation) {
 TEST(StoredReportTest, ADocumentOfAnEarlierProgramMayLackTimeAndTables) {
   EXPECT_EQ(StoredReportFrom(StoredDocumentWith("\"time\"", "\"xtime\""), "a.json").fTime, "");
   EXPECT_TRUE(StoredReportFrom(StoredDocumentWith("\"sections\"", "\"xsections\""), "a.json").fSections.empty());
+}
+
+TEST(StoredReportTest, OfTwoMembersWithOneNameTheLastCounts) {
+  EXPECT_EQ(StoredReportFrom(StoredDocumentWith("\"zep\"", "\"zep\": 7, \"zep\""), "a.json").fZep, "1.0.0");
+}
+
+TEST(StoredReportTest, AChangedDocumentIsReadLikeItsText) {
+  TStoredDocument document = StoredDocumentFrom(StoredDocument(), "a.json");
+  document["head"][0] = "\"other\"";
+  EXPECT_EQ(StoredReportOf(document, "a.json").fHead.at(0), "\"other\"");
+  document["instances"][1]["properties"] = 7;
+  EXPECT_EQ(WhyRefused([&] { StoredReportOf(document, "a.json"); }), "a.json: /instances/1/properties: is not an object");
 }
 
 TEST(StoredReportTest, AnAlteredDocumentIsRefusedWithThePlace) {

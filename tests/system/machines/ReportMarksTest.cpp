@@ -91,5 +91,16 @@ TEST(StoredReportMarksTest, APageIsSmallAndQuick) {
   EXPECT_LE(std::filesystem::file_size(page), 300000u);
 }
 
+// The comparison of two full reports: 50 ms.
+TEST(StoredReportMarksTest, AComparisonIsQuick) {
+  TTempDir const dir;
+  for (char const* const name : {"server", "degraded"}) {
+    TRecordedMachine const machine(name);
+    std::string const before = dir.Path("a.json"), after = dir.Path("b.json");
+    for (std::string const& report : {before, after}) ASSERT_TRUE(UseOf({"report", "--json"}, machine.Root(), report));
+    EXPECT_LE(LeastUseOf({"diff", before, after}, machine.Root()).fCpuMilliseconds, 50) << name;
+  }
+}
+
 }  // namespace
 }  // namespace NQRVZEP20::zep

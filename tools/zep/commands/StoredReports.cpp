@@ -23,7 +23,6 @@ TStoredReport ReadReport(std::string const& file) {
 TJson ReadDocument(std::string const& file, TRedactionArguments const& redaction) {
   try {
     TJson document = ReadStoredDocument(file);
-    StoredReportOf(document, file);
     if (redaction.IsWanted()) RedactDocument(document, redaction);
     return document;
   } catch (TStoredReportError const& failure) {
