@@ -153,9 +153,10 @@ TStoredReport ReportOf(TStoredNode const& document) {
   report.fZep = document.TextOf("zep");
   if (auto const label = document.Optional("label")) report.fLabel = label->Text();
   if (auto const time = document.Optional("time")) report.fTime = time->Text();
-  report.fStatus = document.TextOf("status");
+  report.fStatus = WordOf(document, "status", {"complete", "partial", "nothing"});
   report.fReason = document.TextOrNullOf("reason");
-  if (auto const redaction = document.Optional("redaction")) report.fRedaction = redaction->AsJson();
+  if (auto const redaction = document.Optional("redaction"))
+    report.fRedaction = redaction->Member("map").AsJson() + " " + redaction->Member("kinds").AsJson();
   report.fHead = document.Member("head").Elements([](TStoredNode const& line) { return line.Text(); });
   TStoredNode const findings = document.Member("findings");
   report.fProblems = findings.Member("problems").Elements(ProblemOf);

@@ -101,6 +101,15 @@ TEST(StoredReportTest, OfTwoMembersWithOneNameTheLastCounts) {
   EXPECT_EQ(StoredReportFrom(StoredDocumentWith("\"zep\"", "\"zep\": 7, \"zep\""), "a.json").fZep, "1.0.0");
 }
 
+// The spellings of secrets are of one report only.
+TEST(StoredReportTest, AReportHasTheMapAndTheKindsOfItsRedaction) {
+  std::string const redaction =
+      "\"redaction\": {\"map\": \"0a\", \"kinds\": [\"hosts\"], \"spellings\": [{\"place\": \"/x\", \"letters\": [\"b\"]}]}, ";
+  TStoredReport const report = StoredReportFrom(StoredDocumentWith("\"status\"", redaction + "\"status\""), "a.json");
+  EXPECT_EQ(report.fRedaction, "\"0a\" [\"hosts\"]");
+  EXPECT_EQ(StoredReportFrom(StoredDocument(), "a.json").fRedaction, "");
+}
+
 TEST(StoredReportTest, AChangedDocumentIsReadLikeItsText) {
   TStoredDocument document = StoredDocumentFrom(StoredDocument(), "a.json");
   document["head"][0] = "\"other\"";
@@ -119,6 +128,7 @@ TEST(StoredReportTest, AnAlteredDocumentIsRefusedWithThePlace) {
       {"\"version\": 2", "\"version\": 1", "a.json: /version: is 1, which an older zep wrote; this zep reads version 2"},
       {"\"version\": 2", "\"version\": -2", "a.json: /version: is not a number"},
       {"\"status\"", "\"x\"", "a.json: it has no report: "},
+      {"\"complete\"", "\"finished\"", "a.json: /status: is a word that no report has"},
       {"\"head\": [\"db1", "\"head\": [1, \"db1", "a.json: /head/0: is not a string"},
       {"\"outcome\"", "\"x\"", "a.json: /findings/rules/0: has no member \"outcome\""},
       {"\"wrong\"", "\"so\"", "a.json: /findings/rules/0/outcome: is a word that no report has"},
