@@ -159,30 +159,60 @@ void AddRows(std::vector<TStoredRow> const& before, std::vector<TStoredRow> cons
 }
 
 // The reason may contain a figure that changes, so it does not count.
-bool IsSame(TStoredProblem const& one, TStoredProblem const& other) {
-  return one.fRule == other.fRule && one.fInstance == other.fInstance && one.fSeverity == other.fSeverity;
+bool AreOfOneCause(TStoredProblem const& one, TStoredProblem const& other) {
+  return one.fRule == other.fRule && one.fInstance == other.fInstance;
 }
 
-// The problems of `some` that are not among `others`, which are those of `examined`. Adds why others could not be found there.
-std::vector<TStoredProblem> ProblemsWithout(std::vector<TStoredProblem> const& some, TExamined const& its,
-                                            std::vector<TStoredProblem> const& others, TExamined const& examined,
-                                            std::vector<std::string>& notCompared) {
-  std::vector<TStoredProblem> problems;
-  for (TStoredProblem const& problem : some) {
-    auto const isIt = [&](TStoredProblem const& other) { return IsSame(problem, other); };
-    if (std::any_of(others.begin(), others.end(), isIt)) continue;
-    std::string const why = examined.WhyUnknown(problem, its.Find(problem.fInstance));
+bool IsSame(TStoredProblem const& one, TStoredProblem const& other) {
+  return AreOfOneCause(one, other) && one.fSeverity == other.fSeverity;
+}
+
+// The problems of `some` that are not among `others`.
+std::vector<TStoredProblem> Without(std::vector<TStoredProblem> const& others, std::vector<TStoredProblem> const& some) {
+  std::vector<TStoredProblem> rest;
+  std::copy_if(some.begin(), some.end(), std::back_inserter(rest), [&](TStoredProblem const& problem) {
+    return std::none_of(others.begin(), others.end(), [&](TStoredProblem const& other) { return IsSame(problem, other); });
+  });
+  return rest;
+}
+
+// Removes those that have only another severity from both, and returns them.
+std::vector<TChangedProblem> TakeChanged(std::vector<TStoredProblem>& before, std::vector<TStoredProblem>& after) {
+  std::vector<TChangedProblem> changed;
+  auto const isTaken = [&](TStoredProblem const& problem) {
+    auto const other =
+        std::find_if(before.begin(), before.end(), [&](TStoredProblem const& its) { return AreOfOneCause(its, problem); });
+    if (other == before.end()) return false;
+    changed.push_back({other->fSeverity, problem});
+    before.erase(other);
+    return true;
+  };
+  std::vector<TStoredProblem> rest;
+  for (TStoredProblem& problem : after)
+    if (!isTaken(problem)) rest.push_back(std::move(problem));
+  after = std::move(rest);
+  return changed;
+}
+
+// The problems that were found in `its` and could have been found in `other`. Adds why the rest could not.
+std::vector<TStoredProblem> Comparable(std::vector<TStoredProblem> const& problems, TExamined const& its, TExamined const& other,
+                                       std::vector<std::string>& notCompared) {
+  std::vector<TStoredProblem> comparable;
+  for (TStoredProblem const& problem : problems) {
+    std::string const why = other.WhyUnknown(problem, its.Find(problem.fInstance));
     if (why.empty())
-      problems.push_back(problem);
+      comparable.push_back(problem);
     else
       AddOnce("problem \"" + problem.fReason + "\": " + why, notCompared);
   }
-  return problems;
+  return comparable;
 }
 
 }  // namespace
 
-bool TDifferences::IsSame() const { return fObjects.empty() && fRows.empty() && fNewProblems.empty() && fSolvedProblems.empty(); }
+bool TDifferences::IsSame() const {
+  return fObjects.empty() && fRows.empty() && fNewProblems.empty() && fSolvedProblems.empty() && fChangedProblems.empty();
+}
 
 std::string NameOf(TObjectDifference::EKind kind) {
   return kind == EKind::kGone ? "gone" : kind == EKind::kAppeared ? "appeared" : "changed";
@@ -199,8 +229,10 @@ TDifferences DifferencesOf(TStoredReport const& before, TStoredReport const& aft
   AddChanged(earlier, later, differences);
   AddRows(before.fIdentity, after.fIdentity, differences.fRows);
   AddRows(before.fDetails, after.fDetails, differences.fRows);
-  differences.fNewProblems = ProblemsWithout(after.fProblems, later, before.fProblems, earlier, notCompared);
-  differences.fSolvedProblems = ProblemsWithout(before.fProblems, earlier, after.fProblems, later, notCompared);
+  auto solved = Without(after.fProblems, before.fProblems), appeared = Without(before.fProblems, after.fProblems);
+  differences.fChangedProblems = TakeChanged(solved, appeared);
+  differences.fNewProblems = Comparable(appeared, later, earlier, notCompared);
+  differences.fSolvedProblems = Comparable(solved, earlier, later, notCompared);
   return differences;
 }
 

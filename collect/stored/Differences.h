@@ -24,10 +24,17 @@ struct TObjectDifference {
   std::vector<TChange> fChanges;  // only of a changed object
 };
 
+// A problem that both reports have, with another severity.
+struct TChangedProblem {
+  std::string fSeverityBefore;
+  TStoredProblem fProblem;  // of the later report
+};
+
 struct TDifferences {
   std::vector<TObjectDifference> fObjects;  // those that are gone, then those that appeared, then those that changed
   std::vector<TChange> fRows;               // of the identity and the details
   std::vector<TStoredProblem> fNewProblems, fSolvedProblems;
+  std::vector<TChangedProblem> fChangedProblems;
   std::vector<std::string> fNotCompared;  // why: "provider Storage failed in b.json: no disk"
 
   bool IsSame() const;

@@ -74,6 +74,34 @@ TEST(DifferencesTest, RowsAndProblemsAreCompared) {
   EXPECT_TRUE(DifferencesOf(Before(), With("\"reason\": \"needs root\"", "\"reason\": \"took 5 s\"")).IsSame());
 }
 
+TEST(DifferencesTest, AProblemWhoseSeverityChangesIsNeitherNewNorSolved) {
+  TStoredReport before = Before();
+  before.fRules[0].fNotExamined.clear();
+  TStoredReport after = before;
+  after.fProblems[0].fSeverity = "warning";
+  after.fProblems.push_back({"disk-failing", "error", "the disk sdb is failing", "", "root/x:X_Disk.Name=\"sdb\""});
+  TDifferences const differences = DifferencesOf(before, after);
+  EXPECT_FALSE(differences.IsSame());
+  ASSERT_EQ(differences.fChangedProblems.size(), 1u);
+  EXPECT_EQ(differences.fChangedProblems[0].fSeverityBefore, "error");
+  EXPECT_EQ(differences.fChangedProblems[0].fProblem.fSeverity, "warning");
+  ASSERT_EQ(differences.fNewProblems.size(), 1u);
+  EXPECT_EQ(differences.fNewProblems[0].fReason, "the disk sdb is failing");
+  EXPECT_TRUE(differences.fSolvedProblems.empty());
+}
+
+// Two problems of one cause are two.
+TEST(DifferencesTest, EachProblemIsPairedOnce) {
+  TStoredReport before = Before();
+  before.fRules[0].fNotExamined.clear();
+  TStoredReport after = before;
+  after.fProblems[0].fSeverity = "warning";
+  after.fProblems.push_back(after.fProblems[0]);
+  TDifferences const differences = DifferencesOf(before, after);
+  EXPECT_EQ(differences.fChangedProblems.size(), 1u);
+  EXPECT_EQ(differences.fNewProblems.size(), 1u);
+}
+
 TEST(DifferencesTest, WithinWhatAlwaysChangesReportsAreTheSame) {
   struct {
     char const *fClass, *fProperty, *fBefore, *fAfter, *fHysteresis;

@@ -9,6 +9,8 @@ namespace NQRVZEP20::zep {
 
 namespace {
 
+constexpr char const* kArrow = " \xe2\x86\x92 ";
+
 std::string Item(std::string const& severity, std::string const& kind, std::string const& what, std::string const& more) {
   return "<li class=\"" + Html(severity) + "\">" + Element("span", "class=\"severity\"", kind) +
          Element("p", "class=\"what\"", what) + more + "</li>\n";
@@ -17,9 +19,14 @@ std::string Item(std::string const& severity, std::string const& kind, std::stri
 std::string Changes(std::vector<TChange> const& changes) {
   std::string html;
   for (TChange const& change : changes)
-    html += Element("dt", change.fName) + "<dd>" + Element("del", change.fBefore) + " \xe2\x86\x92 " +
-            Element("ins", change.fAfter) + "</dd>\n";
+    html += Element("dt", change.fName) + "<dd>" + Element("del", change.fBefore) + kArrow + Element("ins", change.fAfter) +
+            "</dd>\n";
   return html.empty() ? "" : "<dl>" + html + "</dl>";
+}
+
+// Of a problem that the later report has.
+std::string Problem(std::string const& kind, TStoredProblem const& problem) {
+  return Item(problem.fSeverity, kind, problem.fReason, problem.fRemedy.empty() ? "" : Element("p", problem.fRemedy));
 }
 
 std::string Object(TObjectDifference const& object) {
@@ -37,9 +44,9 @@ std::string List(std::string const& title, std::string const& items) {
 
 std::string DifferencesAsHtml(TDifferences const& differences, TStoredReport const& before, TStoredReport const& after) {
   std::string problems, objects, notCompared;
-  for (TStoredProblem const& problem : differences.fNewProblems)
-    problems += Item(problem.fSeverity, "new " + problem.fSeverity, problem.fReason,
-                     problem.fRemedy.empty() ? "" : Element("p", problem.fRemedy));
+  for (TStoredProblem const& problem : differences.fNewProblems) problems += Problem("new " + problem.fSeverity, problem);
+  for (auto const& [severityBefore, problem] : differences.fChangedProblems)
+    problems += Problem(severityBefore + kArrow + problem.fSeverity, problem);
   for (TStoredProblem const& problem : differences.fSolvedProblems) problems += Item("fine", "solved", problem.fReason, "");
   for (TObjectDifference const& object : differences.fObjects) objects += Object(object);
   for (std::string const& reason : differences.fNotCompared) notCompared += Item("warning", "not compared", reason, "");

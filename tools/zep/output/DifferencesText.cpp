@@ -38,6 +38,18 @@ TJson AsJson(std::vector<TStoredProblem> const& problems) {
   return json;
 }
 
+TJson AsJson(std::vector<TChangedProblem> const& problems) {
+  TJson json = TJson::array();
+  for (auto const& [before, problem] : problems)
+    json.push_back({{"rule", problem.fRule},
+                    {"before", before},
+                    {"after", problem.fSeverity},
+                    {"reason", problem.fReason},
+                    {"remedy", OrNull(problem.fRemedy)},
+                    {"instance", OrNull(problem.fInstance)}});
+  return json;
+}
+
 // The reasons contain names of files, which were arguments.
 std::vector<std::string> NotCompared(TDifferences const& differences) {
   std::vector<std::string> reasons;
@@ -57,6 +69,8 @@ std::string DifferencesAsText(TDifferences const& differences) {
     lines.push_back("new problem: " + problem.fSeverity + ": " + problem.fReason);
   for (TStoredProblem const& problem : differences.fSolvedProblems)
     lines.push_back("solved problem: " + problem.fSeverity + ": " + problem.fReason);
+  for (auto const& [before, problem] : differences.fChangedProblems)
+    lines.push_back("changed problem: " + before + " -> " + problem.fSeverity + ": " + problem.fReason);
   for (TChange const& row : differences.fRows) lines.push_back("changed: " + TextOf(row));
   for (TObjectDifference const& object : differences.fObjects) lines.push_back(TextOf(object));
   if (lines.empty()) lines.emplace_back("no differences");
@@ -76,8 +90,12 @@ std::string CountsOf(TDifferences const& differences) {
                                      [&](TObjectDifference const& object) { return object.fKind == kind; });
     add(static_cast<std::size_t>(count) + (kind == EKind::kChanged ? differences.fRows.size() : 0), NameOf(kind));
   }
-  add(differences.fNewProblems.size(), differences.fNewProblems.size() == 1 ? "new problem" : "new problems");
-  add(differences.fSolvedProblems.size(), differences.fSolvedProblems.size() == 1 ? "solved problem" : "solved problems");
+  auto const addProblems = [&](std::size_t count, std::string const& what) {
+    add(count, what + (count == 1 ? " problem" : " problems"));
+  };
+  addProblems(differences.fNewProblems.size(), "new");
+  addProblems(differences.fSolvedProblems.size(), "solved");
+  addProblems(differences.fChangedProblems.size(), "changed");
   return Joined(counts, ", ");
 }
 
@@ -98,6 +116,7 @@ TJson DifferencesAsJson(std::string const& document, EExitStatus status, TDiffer
   json["rows"] = AsJson(differences.fRows);
   json["newProblems"] = AsJson(differences.fNewProblems);
   json["solvedProblems"] = AsJson(differences.fSolvedProblems);
+  json["changedProblems"] = AsJson(differences.fChangedProblems);
   json["notCompared"] = NotCompared(differences);
   return json;
 }

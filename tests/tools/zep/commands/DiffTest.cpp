@@ -97,11 +97,13 @@ TEST_F(DiffTest, ThePageOfThisMachineIsThatOfItsDocument) {
 }
 
 TEST_F(DiffTest, TheDifferencesCanBeAPage) {
-  Write("b.json", HealthyDocumentWith("17179869184", "34359738368"));
+  Write("b.json",
+        WithReplaced(HealthyDocumentWith("17179869184", "34359738368"), "\"severity\": \"error\"", "\"severity\": \"warning\""));
   TRun const run = Run({"diff", "a.json", "b.json", "--html", "page"});
   EXPECT_EQ(run.fStatus, 1);
   EXPECT_EQ(run.fOutput, "");
   EXPECT_THAT(ReadFile(fZep.Path("page")), HasSubstr("<ins>32 GiB</ins>"));
+  EXPECT_THAT(Run({"diff", "a.json", "b.json", "--json"}).fOutput, HasSubstr("\"before\": \"error\""));
 }
 
 }  // namespace

@@ -20,6 +20,16 @@ TEST(DifferencesHtmlTest, HasTheObjectsWithTheirChanges) {
   EXPECT_THAT(DifferencesAsHtml(DifferencesOf(before, before), before, before), HasSubstr(">No differences<"));
 }
 
+TEST(DifferencesHtmlTest, AChangedProblemHasBothSeverities) {
+  TStoredReport const before = StoredReportFrom(HealthyDocument(), "a.json"),
+                      after =
+                          StoredReportFrom(HealthyDocumentWith("\"severity\": \"error\"", "\"severity\": \"warning\""), "b.json");
+  EXPECT_THAT(
+      DifferencesAsHtml(DifferencesOf(before, after), before, after),
+      HasSubstr("<li class=\"warning\"><span class=\"severity\">error \xe2\x86\x92 warning</span><p class=\"what\">the disk sda "
+                "is failing</p><p>Replace it.</p>"));
+}
+
 TEST(DifferencesHtmlTest, MarkupIsShownAsText) {
   TStoredReport const before = StoredReportFrom(HealthyDocument(), "a.json"),
                       after = StoredReportFrom(HealthyDocumentWith("DIMM 2", "<b>"), "b.json");

@@ -26,6 +26,8 @@ TEST(DifferencesTextTest, EachDifferenceIsOneLine) {
   gone.fInstances.erase(gone.fInstances.begin());
   gone.fProblems.clear();
   gone.fRules[0].fNotExamined.clear();
+  EXPECT_EQ(TextOf(With("\"severity\": \"error\"", "\"severity\": \"warning\"")),
+            "changed problem: error -> warning: the disk sda is failing\n");
   EXPECT_EQ(TextOf(gone), "solved problem: error: the disk sda is failing\ngone: CIM_PhysicalMemory DIMM 1 (16 GiB)\n");
 }
 
@@ -39,6 +41,18 @@ TEST(DifferencesTextTest, TheDocumentHasBothSidesAndTheCounts) {
   EXPECT_EQ(document["before"], (TJson{{"file", "a.json"}, {"time", "2026-11-23T04:05:06Z"}}));
   EXPECT_EQ(document["objects"][0]["kind"], "gone");
   EXPECT_EQ(document["objects"][0]["path"], "root/x:CIM_PhysicalMemory.Tag=\"1\"");
+}
+
+TEST(DifferencesTextTest, TheDocumentHasBothSeveritiesOfAChangedProblem) {
+  TStoredReport const after = With("\"severity\": \"error\"", "\"severity\": \"critical\"");
+  TJson const document = DifferencesAsJson("zep diff", kExitNothing, DifferencesOf(Before(), after), Before(), after);
+  EXPECT_EQ(document["reason"], "the reports differ: 1 changed problem");
+  EXPECT_EQ(document["changedProblems"], TJson::array({{{"rule", "disk-failing"},
+                                                        {"before", "error"},
+                                                        {"after", "critical"},
+                                                        {"reason", "the disk sda is failing"},
+                                                        {"remedy", "Replace it."},
+                                                        {"instance", "root/x:X_Disk.Name=\"sda\""}}}));
 }
 
 }  // namespace
