@@ -99,7 +99,7 @@ void TEvidenceReading::AddRecording(TEvidence& evidence, std::vector<TPlugIn> co
     TRecorder::TResult result = fRecorder->Finish(plugIns);
     if (result.fIndex.fPlugIns.empty()) throw std::runtime_error("no plug-in was recorded");
     for (TNotRecorded const& row : result.fIndex.fNotRecorded) {
-      evidence.fMissing.push_back({std::string(kRecordingPiece) + " of " + row.fPlugIn, row.fReason});
+      evidence.fMissing.push_back({std::string(kRecordingPiece) + " of " + row.fFile, row.fReason});
       evidence.fFailure = "the recording in the bundle is not complete";
     }
     evidence.fRecording = std::move(result.fArchive);

@@ -52,7 +52,7 @@ TMemberCounts CountsOf(TRecordingIndex const& index) {
 
 std::string ReasonOf(TRecordingIndex const& index) {
   std::string names;
-  for (TNotRecorded const& row : index.fNotRecorded) names += (names.empty() ? "" : ", ") + row.fPlugIn;
+  for (TNotRecorded const& row : index.fNotRecorded) names += (names.empty() ? "" : ", ") + row.fFile;
   if (!names.empty()) return "not everything was recorded: " + names;
   return index.fPlugIns.empty() ? "no plug-in was recorded" : "";
 }
@@ -62,8 +62,7 @@ std::string TextAbout(std::string const& file, TRecordingIndex const& index, std
   std::string text = "The recording " + Printable(file) + " has " + std::to_string(counts.fFiles) + " files and answers with " +
                      std::to_string(counts.fBytes) + " bytes, compressed to " + std::to_string(size) + ", and " +
                      std::to_string(counts.fRefused) + " refusals.\n";
-  for (TNotRecorded const& row : index.fNotRecorded)
-    text += "Not recorded: " + Printable(row.fPlugIn + ": " + row.fReason) + "\n";
+  for (TNotRecorded const& row : index.fNotRecorded) text += "Not recorded: " + Printable(row.fFile + ": " + row.fReason) + "\n";
   return text;
 }
 
@@ -80,7 +79,7 @@ TJson DocumentAbout(std::string const& file, TRecordingIndex const& index, std::
   document["plugIns"] = index.fPlugIns;
   document["notRecorded"] = TJson::array();
   for (TNotRecorded const& row : index.fNotRecorded)
-    document["notRecorded"].push_back({{"plugIn", row.fPlugIn}, {"reason", row.fReason}});
+    document["notRecorded"].push_back({{"file", row.fFile}, {"reason", row.fReason}});
   return document;
 }
 

@@ -124,7 +124,7 @@ TRecordingIndex Read(TJson const& json) {
   index.fThresholds = ThresholdsFrom(json.value("thresholds", TJson::object()));
   index.fPlugIns = json.at("plugIns").get<std::vector<std::string>>();
   for (TJson const& row : json.at("notRecorded"))
-    index.fNotRecorded.push_back({row.at("plugIn").get<std::string>(), row.at("reason").get<std::string>()});
+    index.fNotRecorded.push_back({row.at("file").get<std::string>(), row.at("reason").get<std::string>()});
   for (TJson const& member : json.at("members")) {
     ThrowIfInterrupted();
     index.fMembers.push_back(MemberFrom(member));
@@ -143,7 +143,7 @@ std::string TextOf(TRecordingIndex const& index) {
   for (char const* const list : {"plugIns", "notRecorded", "members"}) json[list] = TJson::array();
   for (std::string const& plugIn : index.fPlugIns) json["plugIns"].push_back(WithBytesEscaped(plugIn));
   for (TNotRecorded const& row : index.fNotRecorded)
-    json["notRecorded"].push_back({{"plugIn", WithBytesEscaped(row.fPlugIn)}, {"reason", WithBytesEscaped(row.fReason)}});
+    json["notRecorded"].push_back({{"file", WithBytesEscaped(row.fFile)}, {"reason", WithBytesEscaped(row.fReason)}});
   for (TRecordedMember const& member : index.fMembers) json["members"].push_back(AsJson(member));
   return json.dump(1) + "\n";
 }

@@ -31,7 +31,7 @@ struct TRecordedMember {
 
 // A plug-in of which the recording has nothing, or a file of the machine that it cannot contain.
 struct TNotRecorded {
-  std::string fPlugIn;  // its file
+  std::string fFile;  // "libHost.nsp.so", or the path in the recording that the file would have
   std::string fReason;
 };
 

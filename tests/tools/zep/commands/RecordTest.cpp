@@ -77,6 +77,7 @@ TEST_F(RecordTest, APlugInThatCannotBeRecordedIsNamedAndNotReplayed) {
   TRun const run = Run({"record", "here.rec"});
   EXPECT_EQ(run.fStatus, 2);
   EXPECT_THAT(run.fOutput, HasSubstr("Not recorded: libClock.nsp.so: it does not read through TMachineFiles of zepcore"));
+  EXPECT_EQ(JsonOf(Run({"record", "again.rec", "--json"}))["notRecorded"][0]["file"], "libClock.nsp.so");
   TRun const replay = Run({"report", "--replay", "here.rec"});
   EXPECT_EQ(replay.fErrors, "zep: here.rec has nothing of libClock.nsp.so, which is therefore not loaded\n");
 }

@@ -38,7 +38,7 @@ TEST_F(TRecorderTest, EachPlugInIsRecordedOrHasTheReason) {
                          .fIndex;
   EXPECT_THAT(index.fPlugIns, ElementsAre("libWhole.nsp.so"));
   std::vector<std::string> notRecorded;
-  for (TNotRecorded const& row : index.fNotRecorded) notRecorded.push_back(row.fPlugIn + ": " + row.fReason);
+  for (TNotRecorded const& row : index.fNotRecorded) notRecorded.push_back(row.fFile + ": " + row.fReason);
   EXPECT_THAT(
       notRecorded,
       ElementsAre("libPart.nsp.so: what it reads could not be written to the temporary directory; free space in it, or name "
@@ -57,7 +57,7 @@ TEST_F(TRecorderTest, AFileWhoseNameIsNotUtf8IsLeftOutAndNamed) {
   TRecordingIndex const index = recorder.Finish({PlugIn("libWhole.nsp.so")}).fIndex;
   std::vector<std::string> names, left;
   for (TRecordedMember const& member : index.fMembers) names.push_back(member.fMember.fName);
-  for (TNotRecorded const& row : index.fNotRecorded) left.push_back(row.fPlugIn);
+  for (TNotRecorded const& row : index.fNotRecorded) left.push_back(row.fFile);
   EXPECT_THAT(names, ElementsAre("root", "root/b", "root/zep-plug-ins", "root/zep-plug-ins/libWhole.nsp.so"));
   EXPECT_THAT(left, testing::UnorderedElementsAre("root/a\xff", "root/c"));
   EXPECT_EQ(index.fNotRecorded[0].fReason, "the name of this file, or the target of this link, is not UTF-8");
@@ -66,6 +66,7 @@ TEST_F(TRecorderTest, AFileWhoseNameIsNotUtf8IsLeftOutAndNamed) {
 // The bytes become escapes in the index.
 TEST_F(TRecorderTest, AReasonThatIsNotUtf8DoesNotPreventTheRecording) {
   TRecordingIndex const index = TRecorder().Finish({PlugIn("libBad.nsp.so", "it \xff")}).fIndex;
+  EXPECT_EQ(IndexFrom(TextOf(index)).fNotRecorded.at(0).fFile, "libBad.nsp.so");
   EXPECT_EQ(IndexFrom(TextOf(index)).fNotRecorded.at(0).fReason, "it \\xff");
 }
 
