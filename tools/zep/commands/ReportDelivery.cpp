@@ -12,6 +12,7 @@
 #include "tools/zep/output/ReportJson.h"
 #include "tools/zep/output/ReportPhrases.h"
 #include "tools/zep/output/Text.h"
+#include "tools/zep/processes/Interrupts.h"
 #include "tools/zep/transfer/ReportFileName.h"
 
 #include <iostream>
@@ -111,10 +112,11 @@ bool IsSendingConfirmed(TReport const& report, TTarget const& target, TReportArg
   return arguments.fIsConfirmed || IsConfirmed("zep: send it to " + target.fRemote.fHost + "?");
 }
 
-// A report that was not sent because the user did not want that.
+// A report that was not sent because the user did not want that, or interrupted the question.
 TSentReport NotConfirmed() {
   TSentReport sent;
-  sent.fTransferred.fOutcome = {kZEPStatusFail, kExitNothing, "this was not confirmed"};
+  sent.fTransferred.fOutcome =
+      PendingInterrupt() != 0 ? Interrupted() : TOutcome{kZEPStatusFail, kExitNothing, "this was not confirmed"};
   std::cerr << "zep: the report was not sent\n";
   return sent;
 }

@@ -231,18 +231,24 @@ TEST_F(RedactingTest, AnUnwritablePageDoesNotPreventSending) {
 
 TEST_F(RedactingTest, ATerminalIsAskedOnceBeforeSending) {
   auto const errorsWith = [&](std::string const& answer, std::string const& options) {
-    std::string const command = "printf '" + answer + "\\n' | TMPDIR='" + fZep.Path("") + "' NETRC=/dev/null script -qec '" +
+    std::string const command = "{ " + answer + "; } | TMPDIR='" + fZep.Path("") + "' NETRC=/dev/null script -qec 'trap : INT; " +
                                 fZep.Path("bin/zep") + " report --sample --send ftp://127.0.0.1:1/d/ " + options +
                                 "; echo status $?' /dev/null > '" + fZep.Path("script") + "'";
+    fs::remove(fZep.Path("script"));
     EXPECT_EQ(std::system(command.c_str()), 0);
     return ReadFile(fZep.Path("script"));
   };
   std::string const question = "zep: send it to 127.0.0.1? [y/N] ";
-  EXPECT_THAT(errorsWith("n", ""),
+  EXPECT_THAT(errorsWith("echo n", ""),
               testing::AllOf(HasSubstr(question), HasSubstr("zep: the report was not sent"), HasSubstr("status 1")));
-  EXPECT_THAT(errorsWith("y", ""),
+  EXPECT_THAT(errorsWith("echo y", ""),
               testing::AllOf(HasSubstr(question), HasSubstr("the report is kept in"), HasSubstr("status 68")));
-  EXPECT_THAT(errorsWith("n", "--yes"), testing::AllOf(Not(HasSubstr("[y/N]")), HasSubstr("status 68")));
+  EXPECT_THAT(errorsWith("echo n", "--yes"), testing::AllOf(Not(HasSubstr("[y/N]")), HasSubstr("status 68")));
+  std::string const controlCAtTheQuestion =
+      "for try in $(seq 400); do grep -qs 'y/N' '" + fZep.Path("script") + "' && break; sleep 0.05; done; printf '\\003'";
+  EXPECT_THAT(errorsWith(controlCAtTheQuestion, "--json"),
+              testing::AllOf(HasSubstr("\"exitStatus\": 130"), HasSubstr("\"reason\": \"the report was not sent: interrupted\""),
+                             HasSubstr("\"url\": null"), HasSubstr("status 130")));
 }
 
 }  // namespace
