@@ -10,15 +10,15 @@
 
 #include <filesystem>
 #include <functional>
+#include <sstream>
 #include <string>
+#include <vector>
 
 namespace NQRVZEP20::zep {
 
-// Keeps the document in the build tree; equal ones once. Tests may run in parallel, so a file gets its name when it is complete.
-inline void KeepDocument(nlohmann::json const& document) {
-  if (!document.is_object() || !document.contains("document")) return;
-  std::string const text = document.dump(-1, ' ', false, nlohmann::json::error_handler_t::replace);
-  std::string const file = BuildPath("documents/" + std::to_string(std::hash<std::string>()(text)) + ".json");
+// Keeps the text in the build tree; equal ones once. Tests may run in parallel, so a file gets its name when it is complete.
+inline void KeepText(std::string const& text, std::string const& suffix) {
+  std::string const file = BuildPath("documents/" + std::to_string(std::hash<std::string>()(text)) + suffix);
   std::string const part = file + "." + std::to_string(::getpid());
   std::error_code ignored;  // another user may run zep, to whom the build tree is closed
   std::filesystem::create_directories(BuildPath("documents"), ignored);
@@ -26,16 +26,24 @@ inline void KeepDocument(nlohmann::json const& document) {
   std::filesystem::rename(part, file, ignored);
 }
 
-// The same for the output of zep: a document, or one on each line. Any other output is ignored.
+// Anything but a document is ignored.
+inline void KeepDocument(nlohmann::json const& document) {
+  if (document.is_object() && document.contains("document"))
+    KeepText(document.dump(-1, ' ', false, nlohmann::json::error_handler_t::replace), ".json");
+}
+
+// The same for the output of zep: a document, one on each line, or a report in lines, of which only the first is a document.
 inline void KeepDocuments(std::string const& output) {
   if (output.empty() || output.front() != '{') return;
-  auto const document = nlohmann::json::parse(output, nullptr, false);
-  if (!document.is_discarded()) return KeepDocument(document);
-  std::istringstream lines(output);
-  for (std::string line; std::getline(lines, line);) {
-    auto const ofLine = nlohmann::json::parse(line, nullptr, false);
-    if (!ofLine.is_discarded()) KeepDocument(ofLine);
+  std::vector<nlohmann::json> documents = {nlohmann::json::parse(output, nullptr, false)};
+  if (documents.front().is_discarded()) {
+    documents.clear();
+    std::istringstream lines(output);
+    for (std::string line; std::getline(lines, line);) documents.push_back(nlohmann::json::parse(line, nullptr, false));
+    if (documents.size() > 1 && documents.back().is_object() && !documents.back().contains("document"))
+      return KeepText(output, ".jsonl");
   }
+  for (nlohmann::json const& document : documents) KeepDocument(document);
 }
 
 }  // namespace NQRVZEP20::zep

@@ -5,7 +5,7 @@
     check-documents.py SCHEMAS MEMBERS [DOCUMENTS]
 
 SCHEMAS: the directory with *.schema.json. MEMBERS: the directory that lists the members of each version. DOCUMENTS: a directory
-of documents, each in a file *.json. Every schema must be valid, and no member of a version may change or go: members-VERSION.txt
+of documents, each in a file *.json, and of reports in lines, each in a file *.jsonl. Every schema must be valid, and no member of a version may change or go: members-VERSION.txt
 has a line for each, with its type. A new member is added to the list with --record in place of DOCUMENTS. A directory without
 documents proves nothing: the exit status is then 77, which ctest shows as skipped, or 1 with CI=true.
 """
@@ -23,6 +23,7 @@ except ImportError:
     print("the package python3-jsonschema is not installed")
     sys.exit(SKIPPED)
 
+LINES = "zep report --format jsonl"  # the title of the schema for a line
 KIND = ("type", "const", "enum", "$ref")
 
 
@@ -86,14 +87,25 @@ def check_members(schemas, directory, is_recording):
             [f"{line}: new, and not in {path.name} (--record)" for line in sorted(now - recorded)])
 
 
-def problems_of(path):
-    """The problems of one document: its file, the place, and what is wrong there."""
-    document = read(path)
-    validator = checkers.get(document["document"])
+def problems_in(document, title, name):
+    """The problems of one document or line: its file, the place, and what is wrong there."""
+    validator = checkers.get(title)
     if validator is None:
-        return [f"{path.name}: no schema for \"{document['document']}\""]
+        return [f"{name}: no schema for \"{title}\""]
     found = sorted(validator.iter_errors(document), key=lambda error: len(error.absolute_path), reverse=True)
-    return [f"{path.name} ({document['document']}): /{'/'.join(map(str, error.absolute_path))}: {error.message[:300]}" for error in found[:3]]
+    return [f"{name} ({title}): /{'/'.join(map(str, error.absolute_path))}: {error.message[:300]}" for error in found[:3]]
+
+
+def problems_of(path):
+    """The problems of one document, or of the lines of one report."""
+    if path.suffix == ".json":
+        document = read(path)
+        return problems_in(document, document["document"], path.name)
+    lines = [json.loads(line) for line in path.read_text(encoding="utf-8").splitlines()]
+    problems = [f"{path.name}: the last line has not the number of instances"] if lines[-1].get("instances") != len(lines) - 2 else []
+    for number, line in enumerate(lines, 1):
+        problems += problems_in(line, LINES, f"{path.name}:{number}")
+    return problems[:3]
 
 
 def main():
@@ -102,7 +114,7 @@ def main():
     checkers = validators(schemas)
     documents = Path(sys.argv[3]) if len(sys.argv) > 3 and sys.argv[3] != "--record" else None
     problems = check_members(schemas, lists, sys.argv[3:] == ["--record"])
-    paths = sorted(documents.glob("*.json")) if documents else []
+    paths = sorted([*documents.glob("*.json"), *documents.glob("*.jsonl")]) if documents else []
     with multiprocessing.Pool() as pool:
         for found in pool.imap_unordered(problems_of, paths, 4):
             problems += found
