@@ -22,6 +22,17 @@ using testing::HasSubstr;
 
 class ProvidersAtWorkTest : public TMisbehavingPlugInsTest {
 protected:
+  // Starts zep with these arguments of a shell.
+  pid_t Start(std::string const& arguments, TTempDir const& temporary) const {
+    pid_t const zep = ::fork();
+    if (zep != 0) return zep;
+    ::setenv("ZEP_MISDEEDS", fZep.Path("").c_str(), 1);
+    ::setenv("TMPDIR", temporary.Path().c_str(), 1);
+    std::string const line = "exec '" + fZep.Path("bin/zep") + "' " + arguments;
+    ::execl("/bin/sh", "sh", "-c", line.c_str(), nullptr);
+    ::_exit(127);
+  }
+
   // Interrupts the running zep while it fills the plug-in Hangs: it ends by the signal, and the plug-in with it.
   void InterruptWhileItHangs(pid_t zep) const {
     WaitFor("Hangs");
@@ -171,18 +182,21 @@ TEST_F(ProvidersAtWorkTest, AnInterruptedRecordingOrBundleLeavesNoFiles) {
   TTempDir const temporary, work;
   for (char const* command : {"record", "report --bundle"}) {
     fs::remove(fZep.Path("Hangs"));
-    pid_t const zep = ::fork();
-    if (zep == 0) {
-      ::setenv("ZEP_MISDEEDS", fZep.Path("").c_str(), 1);
-      ::setenv("TMPDIR", temporary.Path().c_str(), 1);
-      std::string const line = "exec '" + fZep.Path("bin/zep") + "' " + command + " '" + work.Path("new") + "'";
-      ::execl("/bin/sh", "sh", "-c", line.c_str(), nullptr);
-      ::_exit(127);
-    }
-    InterruptWhileItHangs(zep);
+    InterruptWhileItHangs(Start(command + (" '" + work.Path("new") + "'"), temporary));
     EXPECT_TRUE(fs::is_empty(temporary.Path())) << command;
     EXPECT_TRUE(fs::is_empty(work.Path())) << command;
   }
+}
+
+// The plug-in that hangs takes the place of one that was recorded.
+TEST_F(ProvidersAtWorkTest, AnInterruptedReplayLeavesNoFiles) {
+  fZep.Remove("libHost.nsp.so");
+  fZep.Add("libHangs.nsp.so", TEST_LIB_DIR "/libHost.nsp.so");
+  ASSERT_EQ(Run({"record", fZep.Path("here.rec")}).fStatus, 0);
+  Add({"Hangs"});
+  TTempDir const temporary;
+  InterruptWhileItHangs(Start("report --replay '" + fZep.Path("here.rec") + "'", temporary));
+  EXPECT_TRUE(fs::is_empty(temporary.Path()));
 }
 
 TEST_F(ProvidersAtWorkTest, APlugInThatKillsZepLeavesNoProcess) {
