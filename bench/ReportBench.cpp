@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 
 // Compares the whole report on this machine, with all provider plug-ins beside libzepcore.so, with the description that lshw
-// makes. Each run is a fresh process, whose output is read through a pipe.
+// makes, and the comparison of two stored reports with that by the json module of Python. Each run is a fresh process, whose
+// output is read through a pipe.
 
 #include <benchmark/benchmark.h>
 #include <stdio.h>
@@ -45,5 +46,33 @@ BENCHMARK(Json_Zep)->UseManualTime()->Iterations(3)->Unit(benchmark::kMicrosecon
 
 void Json_lshw(benchmark::State& state) { Time(state, "/usr/bin/lshw", "-json"); }
 BENCHMARK(Json_lshw)->UseManualTime()->Iterations(3)->Unit(benchmark::kMicrosecond);
+
+// Two reports on this machine, while it exists.
+class TTwoReports {
+public:
+  TTwoReports() {
+    for (char const* const file : {kBefore, kAfter}) Run(std::string(ZEP_PROGRAM) + " report --json | tee " + file);
+  }
+  ~TTwoReports() {
+    for (char const* const file : {kBefore, kAfter}) std::remove(file);
+  }
+
+  static constexpr char const *kBefore = "ReportBench-before.json", *kAfter = "ReportBench-after.json";
+};
+
+void Diff_Zep(benchmark::State& state) {
+  TTwoReports const reports;
+  Time(state, ZEP_PROGRAM, std::string("diff ") + reports.kBefore + " " + reports.kAfter);
+}
+BENCHMARK(Diff_Zep)->UseManualTime()->Iterations(3)->Unit(benchmark::kMicrosecond);
+
+// Reads both, and compares their objects as a whole.
+void Diff_Python(benchmark::State& state) {
+  TTwoReports const reports;
+  std::string const load = "json.load(open(\"", instances = "\"))[\"instances\"]";
+  Time(state, "/usr/bin/python3",
+       "-c 'import json; print(" + load + reports.kBefore + instances + " == " + load + reports.kAfter + instances + ")'");
+}
+BENCHMARK(Diff_Python)->UseManualTime()->Iterations(3)->Unit(benchmark::kMicrosecond);
 
 }  // namespace
