@@ -12,7 +12,7 @@ namespace NQRVZEP20 {
 namespace {
 
 struct TParameter {
-  std::string_view fName;  // also the end of a longer name: "rd.iscsi.password"
+  std::string_view fName;  // also the last words of a longer name: "rd.iscsi.password"; of a password, its end: "vncpassword"
   EMeaning fMeaning;
 };
 
@@ -29,20 +29,32 @@ constexpr TParameter kParameters[] = {
     {"user", EMeaning::kUser},
     {"username", EMeaning::kUser},
     {"login", EMeaning::kUser},
+    {"uname", EMeaning::kUser},  // of 9p
     {"password", EMeaning::kPassword},
     {"passwd", EMeaning::kPassword},
     {"pass", EMeaning::kPassword},
     {"password2", EMeaning::kPassword},
     {"pass2", EMeaning::kPassword},
     {"passphrase", EMeaning::kPassword},
-    {"rootpw", EMeaning::kPassword},
+    {"pw", EMeaning::kPassword},
+    {"psk", EMeaning::kPassword},
+    {"apikey", EMeaning::kPassword},
+    {"api-key", EMeaning::kPassword},
     {"secret", EMeaning::kPassword},
     {"token", EMeaning::kPassword},
     {"credential", EMeaning::kPassword},
+    {"credentials", EMeaning::kPassword},
     {"initiator", EMeaning::kSerial},
     {"target-name", EMeaning::kSerial},
+    {"hostnqn", EMeaning::kSerial},
+    {"nqn", EMeaning::kSerial},
+    {"serialno", EMeaning::kSerial},
+    {"serial-number", EMeaning::kSerial},
+    {"system-serial", EMeaning::kSerial},
+    {"asset-tag", EMeaning::kSerial},
     {"machine-id", EMeaning::kSerial},
     {"instance-id", EMeaning::kSerial},
+    {"unique-id", EMeaning::kSerial},
     {"fsid", EMeaning::kSerial},
     {"uuid", EMeaning::kSerial},
     {"partuuid", EMeaning::kSerial},
@@ -56,9 +68,11 @@ std::string PlainName(std::string_view name) {
   return plain;
 }
 
-bool EndsIn(std::string_view name, std::string_view end) {
+bool EndsIn(std::string_view name, TParameter const& parameter) {
+  std::string_view const end = parameter.fName;
   if (name.size() < end.size() || name.substr(name.size() - end.size()) != end) return false;
-  return name.size() == end.size() || name[name.size() - end.size() - 1] == '-';
+  bool const isWord = name.size() == end.size() || name[name.size() - end.size() - 1] == '-';
+  return isWord || parameter.fMeaning == EMeaning::kPassword;
 }
 
 std::vector<std::string_view> Split(std::string_view text, std::string_view separators) {
@@ -93,16 +107,12 @@ bool IsName(std::string_view text) {
 
 class TSettings {
 public:
-  // "alice:secret@nas1:2049"; of iSCSI there may be a second account with its password.
+  // "alice:secret@nas1:2049"
   void AddAuthority(std::string_view text) {
     std::size_t const at = text.rfind('@');
     std::string_view const accounts = text.substr(0, at == text.npos ? 0 : at);
     if (accounts.find('/') != accounts.npos) return;
-    EMeaning meaning = EMeaning::kUser;
-    for (std::string_view const field : Split(accounts, ":")) {
-      Add(meaning, field);
-      meaning = meaning == EMeaning::kUser ? EMeaning::kPassword : EMeaning::kUser;
-    }
+    AddAccounts(accounts);
     std::string_view const host = HostBefore(at == text.npos ? text : text.substr(at + 1));
     if (IsName(host)) Add(EMeaning::kHost, host);
   }
@@ -140,15 +150,27 @@ private:
     if (!value.empty() && !isKnown) fSettings.push_back({meaning, std::string(value)});
   }
 
+  // "alice:secret"; of iSCSI there may be a second account with its password.
+  void AddAccounts(std::string_view accounts) {
+    EMeaning meaning = EMeaning::kUser;
+    for (std::string_view const field : Split(accounts, ":")) {
+      Add(meaning, field);
+      meaning = meaning == EMeaning::kUser ? EMeaning::kPassword : EMeaning::kUser;
+    }
+  }
+
   bool AddKnown(std::string_view name, std::string_view value) {
     constexpr std::string_view luks = "luks-";
     std::string const plain = PlainName(name);
-    auto const known = std::find_if(std::begin(kParameters), std::end(kParameters),
-                                    [&](TParameter const& each) { return EndsIn(plain, each.fName); });
+    auto const known =
+        std::find_if(std::begin(kParameters), std::end(kParameters), [&](TParameter const& each) { return EndsIn(plain, each); });
     if (known == std::end(kParameters)) return false;
     if (known->fName == "credential") value.remove_prefix(std::min(value.find(':') + 1, value.size()));
     if (BeginsWith(value, luks)) value.remove_prefix(luks.size());
-    Add(known->fMeaning, value);
+    if (known->fName == "credentials" && value.find(':') != value.npos)
+      AddAccounts(value);
+    else
+      Add(known->fMeaning, value);
     return true;
   }
 
@@ -192,6 +214,11 @@ void AddAssignment(TSettings& settings, std::string_view text) {
   if (equals != text.npos) settings.AddParameter(text.substr(0, equals), text.substr(equals + 1));
 }
 
+// The options of ceph, where the name is that of an account. Those of cgroup have the name of a hierarchy, and no secret.
+bool AreOfCeph(std::vector<std::string_view> const& options) {
+  return std::any_of(options.begin(), options.end(), [](std::string_view option) { return BeginsWith(option, "secret="); });
+}
+
 }  // namespace
 
 std::vector<TSetting> SettingsInSource(std::string_view source) {
@@ -203,8 +230,15 @@ std::vector<TSetting> SettingsInSource(std::string_view source) {
 }
 
 std::vector<TSetting> SettingsInOptions(std::string_view options) {
+  constexpr std::string_view name = "name=";
   TSettings settings;
-  for (std::string_view const option : Split(options, ",")) AddAssignment(settings, option);
+  auto const all = Split(options, ",");
+  bool const areOfCeph = AreOfCeph(all);
+  for (std::string_view const option : all)
+    if (areOfCeph && BeginsWith(option, name))
+      settings.AddParameter("username", option.substr(name.size()));
+    else
+      AddAssignment(settings, option);
   return settings.Take();
 }
 
