@@ -14,7 +14,7 @@ enum class ESecretKind {
   kSerials,    // serial numbers, UUIDs, world wide names, asset tags
   kHosts,      // names of hosts and domains
   kAddresses,  // MAC and IP addresses
-  kUsers       // names of accounts
+  kUsers       // names of accounts and persons
 };
 
 constexpr std::array<ESecretKind, 4> kSecretKinds = {ESecretKind::kSerials, ESecretKind::kHosts, ESecretKind::kAddresses,

@@ -19,6 +19,8 @@ struct TSecretProperty {
 
 constexpr TSecretProperty kProperties[] = {
     {"", "SerialNumber", EMeaning::kSerial},
+    {"", "SerialNumbers", EMeaning::kSerial},
+    {"", "ServiceTag", EMeaning::kSerial},
     {"", "IdentifyingNumber", EMeaning::kSerial},
     {"", "AssetTag", EMeaning::kSerial},
     {"", "UserTracking", EMeaning::kSerial},
@@ -32,6 +34,7 @@ constexpr TSecretProperty kProperties[] = {
     {"", "DeviceWWN", EMeaning::kSerial},
     {"", "PortWWN", EMeaning::kSerial},
     {"", "NodeWWN", EMeaning::kSerial},
+    {"", "NodeName", EMeaning::kSerial},
     {"CIM_DiskPartition", "Signature", EMeaning::kSerial},
     {"CIM_GPTDiskPartition", "Signature", EMeaning::kSerial},
 
@@ -43,13 +46,19 @@ constexpr TSecretProperty kProperties[] = {
     {"", "HostName", EMeaning::kHost},
     {"", "Hostname", EMeaning::kHost},
     {"", "DNSHostName", EMeaning::kHost},
+    {"", "RequestedHostname", EMeaning::kHost},
     {"", "DomainName", EMeaning::kDomain},
     {"", "SearchDomains", EMeaning::kDomain},
     {"", "DNSSuffixesToRegister", EMeaning::kDomain},
+    {"", "DNSSuffixesToAppend", EMeaning::kDomain},
+    {"CIM_RemoteServiceAccessPoint", "AccessInfo", EMeaning::kUrl},
 
     {"", "MACAddress", EMeaning::kAddress},
     {"", "PermanentAddress", EMeaning::kAddress},
     {"", "NetworkAddresses", EMeaning::kAddress},
+    {"", "AliasAddresses", EMeaning::kAddress},
+    {"", "GroupAddresses", EMeaning::kAddress},
+    {"", "ClientIdentifier", EMeaning::kAddress},
     {"", "PartnerMACAddress", EMeaning::kAddress},
     {"", "BridgeAddress", EMeaning::kAddress},
     {"", "DesignatedBridge", EMeaning::kAddress},
@@ -63,14 +72,21 @@ constexpr TSecretProperty kProperties[] = {
     {"", "DefaultGateway", EMeaning::kAddress},
     {"", "PreferredSource", EMeaning::kAddress},
     {"", "DestinationAddress", EMeaning::kAddress},
+    {"", "IPDestinationAddress", EMeaning::kAddress},
     {"", "DNSServerAddresses", EMeaning::kAddress},
     {"", "ARPTargets", EMeaning::kAddress},
-    {"CIM_RemoteServiceAccessPoint", "AccessInfo", EMeaning::kAddress},
 
     {"", "UserID", EMeaning::kUser},
     {"", "UserName", EMeaning::kUser},
     {"", "PrimaryOwnerName", EMeaning::kUser},
     {"", "PrimaryOwnerContact", EMeaning::kUser},
+    {"", "GivenName", EMeaning::kUser},
+    {"", "Surname", EMeaning::kUser},
+    {"", "Mail", EMeaning::kUser},
+    {"", "TelephoneNumber", EMeaning::kUser},
+    {"CIM_UserEntity", "Name", EMeaning::kUser},
+    {"CIM_UserContact", "Name", EMeaning::kUser},
+    {"CIM_Person", "Name", EMeaning::kUser},
     {"CIM_Account", "Name", EMeaning::kUser},
     {"ZEP_ControllerAccount", "Name", EMeaning::kUser},
 
@@ -82,8 +98,8 @@ constexpr TSecretProperty kProperties[] = {
 };
 
 constexpr std::string_view kFreeTexts[] = {
-    "Message", "RecordData", "Text",    "KernelCommandLine", "Alias",        "Caption", "Description",
-    "Reason",  "Source",     "Options", "FileSystemOptions", "OtherSettings"};
+    "Address", "NextHop",     "Message", "RecordData", "Text",    "KernelCommandLine", "Alias",
+    "Caption", "Description", "Reason",  "Source",     "Options", "FileSystemOptions", "OtherSettings"};
 
 constexpr std::string_view kUsualTexts[] = {"not specified",
                                             "not available",

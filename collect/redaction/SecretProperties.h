@@ -16,6 +16,7 @@ enum class EMeaning {
   kHost,
   kDomain,
   kAddress,
+  kUrl,  // of a service, or its host or address with or without a port
   kUser,
   kPassword,
   kSource,      // of a mount (SettingTexts.h)
@@ -36,7 +37,8 @@ ESecretKind KindOf(EMeaning meaning);
 // Whether an element of OtherIdentifyingInfo with this description is a serial number: "Serial number", "NAA".
 bool DescribesSerial(std::string_view description);
 
-// Whether a property holds free text of the kernel, the firmware or an administrator, in which IPv4 addresses are looked for.
+// Whether a property holds free text of the kernel, the firmware or an administrator, or something else in which an IPv4 address
+// is not a version. IPv4 addresses are looked for in it.
 bool IsFreeText(std::string_view property);
 
 // Whether the value identifies nothing: it is shorter than three characters, consists of one repeated character, is one of the

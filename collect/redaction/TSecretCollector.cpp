@@ -164,6 +164,9 @@ void TSecretCollector::AddMeant(EMeaning meaning, std::string const& text) {
       return AddDomain(text);
     case EMeaning::kAddress:
       return Add(ESecretKind::kAddresses, HostIn(text));
+    case EMeaning::kUrl:
+      if (text.find("://") != text.npos) addAll(SettingsInSource(text));
+      return AddHost(HostIn(text));
     case EMeaning::kUser:
       return AddUser(text);
     case EMeaning::kPassword:

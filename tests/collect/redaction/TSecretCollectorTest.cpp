@@ -23,6 +23,21 @@ TEST(TSecretCollectorTest, EachKindOfPropertyHasItsPseudonym) {
       {"IPv6Address", "2001:db8::77", "address-"},
       {"AccessInfo", "192.0.2.78", ""},
       {"UserID", "mallory", "user-"},
+      {"SerialNumbers", "ZX81-78", "serial-"},
+      {"ServiceTag", "7HQXK22", "serial-"},
+      {"NodeName", "eui.00253885a1b2c3d4", "serial-"},
+      {"RequestedHostname", "q78.example.net", "host-"},
+      {"DNSSuffixesToAppend", "qlab.example.net", "host-"},
+      {"IPDestinationAddress", "192.0.2.81", "address-"},
+      {"NextHop", "192.0.2.82", "address-"},
+      {"Address", "192.0.2.83", "address-"},
+      {"AliasAddresses", "525400112203", "address-"},
+      {"GroupAddresses", "3333ff112204", "address-"},
+      {"ClientIdentifier", "01:52:54:00:11:22:05", "address-"},
+      {"Surname", "Quillfeather", "user-"},
+      {"GivenName", "Quentin", "user-"},
+      {"Mail", "quentin@example.net", "user-"},
+      {"TelephoneNumber", "+44 1632 960077", "user-"},
       {"SystemName", "192.0.2.79", "address-"},
       {"Colour", "ZX81-77", ""},
   };
@@ -42,6 +57,11 @@ TEST(TSecretCollectorTest, AClassInheritsThePropertiesOfItsSuperclasses) {
   EXPECT_THAT(Redacted(document), testing::HasSubstr("rack-row-9"));
   document["classes"] = TJson::array({{{"class", "X_Rack"}, {"superclasses", {"X_Base", "CIM_System"}}}});
   EXPECT_THAT(Redacted(document), testing::Not(testing::HasSubstr("rack-row-9")));
+}
+
+TEST(TSecretCollectorTest, APersonIsASecret) {
+  TJson const document = DocumentWith(InstanceOf("CIM_UserContact", {{"Name", PropertyOf("string", "Quentin Quill")}}));
+  EXPECT_THAT(Redacted(document), testing::Not(testing::HasSubstr("Quill")));
 }
 
 TEST(TSecretCollectorTest, NamesAreTheSameInUpperAndLowerCase) {
@@ -181,10 +201,19 @@ TEST(TSecretCollectorTest, AddressesAreFoundInEveryNotationOfAMessage) {
 TEST(TSecretCollectorTest, OfAUrlTheHostIsASecretAndOfAnAddressNotThePort) {
   TJson const service = {{"AccessInfo", PropertyOf("string", "https://bmc77.example:8443/redfish")}};
   TJson document = DocumentWith(InstanceOf("CIM_RemoteServiceAccessPoint", service));
-  document["head"][0] = "bmc77.example answers";
+  document["head"][0] = "bmc77.example answers, bmc77 does not";
   std::string const text = Redacted(document);
   EXPECT_THAT(text, testing::Not(testing::HasSubstr("bmc77")));
-  EXPECT_THAT(text, testing::ContainsRegex("https://address-[0-9]+:8443/redfish"));
+  EXPECT_THAT(text, testing::ContainsRegex("https://host-[0-9]+:8443/redfish"));
+}
+
+TEST(TSecretCollectorTest, TheAddressOfAServiceHasNoPort) {
+  for (char const* address : {"192.0.2.84:443", "[2001:db8::84]:443", "https://192.0.2.84/redfish"}) {
+    TJson const service = {{"AccessInfo", PropertyOf("string", address)}};
+    std::string const text = Redacted(DocumentWith(InstanceOf("CIM_RemoteServiceAccessPoint", service)));
+    EXPECT_THAT(text, testing::Not(testing::AnyOf(testing::HasSubstr("192.0.2.84"), testing::HasSubstr("db8::84")))) << address;
+    EXPECT_THAT(text, testing::HasSubstr("address-")) << address;
+  }
 }
 
 TEST(TSecretCollectorTest, TheFirstLabelOfADomainIsAWord) {
