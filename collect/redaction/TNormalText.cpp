@@ -11,6 +11,8 @@ namespace NQRVZEP20 {
 
 namespace {
 
+constexpr std::string_view kMarks("-\0", 2);
+
 struct TMark {
   std::size_t fSize = 0;
   bool fIsNul = false;
@@ -78,11 +80,21 @@ bool TNormalText::HasWordEnd(std::size_t size) const {
   return size > 0 && size <= fText.size() && !isMark(size - 1) && (size == fText.size() || isMark(size));
 }
 
+std::size_t TNormalText::LastWordEnd(std::size_t size) const {
+  while (size > 0 && !HasWordEnd(size)) --size;
+  return size;
+}
+
 std::string NormalWords(std::string_view text) {
-  constexpr std::string_view marks("-\0", 2);
   TNormalText const normal(text, text.size());
-  std::size_t const begin = normal.Text().find_first_not_of(marks), end = normal.Text().find_last_not_of(marks);
+  std::size_t const begin = normal.Text().find_first_not_of(kMarks), end = normal.Text().find_last_not_of(kMarks);
   return begin == std::string_view::npos ? "" : std::string(normal.Text().substr(begin, end - begin + 1));
+}
+
+std::string FirstWordsOf(std::string const& normal, std::size_t most) {
+  if (normal.size() <= most) return normal;
+  std::size_t const mark = normal.find_last_of(kMarks, most);
+  return normal.substr(0, mark == normal.npos ? normal.find_first_of(kMarks) : normal.find_last_not_of(kMarks, mark) + 1);
 }
 
 std::size_t SizeOfEscapeAt(std::string_view text, std::size_t at) {

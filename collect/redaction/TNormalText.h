@@ -21,6 +21,9 @@ public:
   // Whether a word ends after `size` characters, one to `most` of the constructor.
   bool HasWordEnd(std::size_t size) const;
 
+  // The end of the last word that ends within `size` characters, up to `most`; 0 if none does.
+  std::size_t LastWordEnd(std::size_t size) const;
+
   // The place in the text after `size` characters.
   std::size_t EndOf(std::size_t size) const { return size == 0 ? 0 : fEnds[size - 1]; }
 
@@ -31,6 +34,9 @@ private:
 
 // The normal form of all words of a text, without the marks before and after them.
 std::string NormalWords(std::string_view text);
+
+// The first words of a normal form that begins with a word: as many as have `most` characters, but at least one.
+std::string FirstWordsOf(std::string const& normal, std::size_t most);
 
 // The size of an escape at the begin of a word, whose backslash or '%' precedes it: 2 of "20zx81" in "%20zx81"; 0 if there is
 // none.

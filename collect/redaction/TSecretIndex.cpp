@@ -9,12 +9,15 @@
 #include <algorithm>
 #include <cstdint>
 #include <functional>
+#include <iterator>
 
 namespace NQRVZEP20 {
 
 namespace {
 
-constexpr std::size_t kPartSize = 6;  // the bytes by which a part of a word is found
+constexpr std::size_t kMostWords = 200;  // the characters of a normal form by which it is found
+constexpr std::size_t kPartSize = 6,
+                      kMostPart = 64;  // the bytes of a part of a word by which it is found, the least and the most
 
 // A hash of the text in lower case.
 std::uint32_t HashOf(std::string_view text) {
@@ -44,10 +47,9 @@ std::string Upper(std::string text) {
   return text;
 }
 
-// `lower` is in lower case.
-bool IsSame(std::string_view text, std::string_view lower) {
-  return text.size() == lower.size() &&
-         std::equal(text.begin(), text.end(), lower.begin(), [](char a, char b) { return Lower(a) == b; });
+// The number of bytes at the begin of both.
+std::size_t SizeOfSame(std::string_view a, std::string_view b) {
+  return static_cast<std::size_t>(std::mismatch(a.begin(), a.end(), b.begin(), b.end()).first - a.begin());
 }
 
 std::size_t FirstWord(std::string_view text) {
@@ -77,7 +79,7 @@ void TSecretIndex::Add(ESecretKind kind, std::string const& value) {
   if (!isNew) AddCase(value);
   for (std::string const& text : SpellingsOf(value)) {
     AddSpelling(text, {secret, false, false});
-    if (EndOfWord(text, 0) == text.size() && HasDigit(text)) AddPart({Lower(text), secret, false});
+    if (EndOfWord(text, 0) == text.size() && HasDigit(text)) AddPart(text, {secret, false});
   }
   for (std::string const& text : Base64Of(value)) AddBase64(text, secret);
 }
@@ -92,28 +94,31 @@ void TSecretIndex::AddCase(std::string const& value) {
 void TSecretIndex::AddSpelling(std::string const& text, TSpelling const& spelling) {
   std::string const normal = NormalWords(text);
   if (normal.empty() || (!spelling.fIsValue && fSpellings.count(normal) > 0)) return;
-  fSpellings[normal] = spelling;
+  std::string const head = FirstWordsOf(normal, kMostWords);
+  if (head.size() == normal.size())
+    fSpellings[normal] = spelling;
+  else
+    fLong[head].emplace(normal, spelling.fSecret);
   std::string const word = normal.substr(0, EndOfWord(normal, 0));
   fWords.set(HashOf(word) % kHashes);
   auto& sizes = fSizes[word];
-  auto const place = std::lower_bound(sizes.begin(), sizes.end(), normal.size(), std::greater<>());
-  if (place == sizes.end() || *place != normal.size()) sizes.insert(place, normal.size());
+  auto const place = std::lower_bound(sizes.begin(), sizes.end(), head.size(), std::greater<>());
+  if (place == sizes.end() || *place != head.size()) sizes.insert(place, head.size());
 }
 
 // The marks '+' and '/' separate words of base64.
 void TSecretIndex::AddBase64(std::string const& text, std::size_t secret) {
   for (std::size_t begin = 0; begin < text.size();) {
     std::size_t const end = EndOfWord(text, begin);
-    AddPart({Lower(text.substr(begin, end - begin)), secret, true});
+    AddPart(std::string_view(text).substr(begin, end - begin), {secret, true});
     begin = end + 1;
   }
 }
 
-void TSecretIndex::AddPart(TPart part) {
-  if (part.fText.size() < kPartSize) return;
-  std::string const first = part.fText.substr(0, kPartSize);
-  fBegins.set(HashOf(first) % kHashes);
-  fParts[first].push_back(std::move(part));
+void TSecretIndex::AddPart(std::string_view text, TPart const& part) {
+  if (text.size() < kPartSize) return;
+  fBegins.set(HashOf(text.substr(0, kPartSize)) % kHashes);
+  fParts.emplace(Lower(text.substr(0, kMostPart)), part);
 }
 
 TSecret const& TSecretIndex::SecretOf(std::string const& value) const { return fSecrets[fKnown.at(CanonicalForm(value))]; }
@@ -163,12 +168,35 @@ TSecretIndex::THit TSecretIndex::LongestAt(std::string_view text, std::size_t fr
   TNormalText const normal(text.substr(begin), sizes->second.front());
   for (std::size_t const size : sizes->second) {
     if (!normal.HasWordEnd(size)) continue;
-    auto const found = fSpellings.find(std::string(normal.Text().substr(0, size)));
+    std::string const head(normal.Text().substr(0, size));
+    if (THit const hit = LongHitAt(text, begin, head); hit.fEnd > 0) return hit;
+    auto const found = fSpellings.find(head);
     THit const hit{begin, begin + normal.EndOf(size), found == fSpellings.end() ? nullptr : &fSecrets[found->second.fSecret]};
     if (hit.fSecret == nullptr || !IsAsWritten(found->second, text.substr(begin, hit.fEnd - begin))) continue;
     return found->second.fIsValue ? WithSigns(hit, text, from) : hit;
   }
   return {};
+}
+
+// The words that are the same as those of a spelling that begins with `head`. At each step, twice as many characters are
+// compared: the time is in proportion to the size of the hit.
+TSecretIndex::THit TSecretIndex::LongHitAt(std::string_view text, std::size_t begin, std::string const& head) const {
+  auto const found = fLong.find(head);
+  if (found == fLong.end()) return {};
+  TLongSpellings const& spellings = found->second;
+  for (std::size_t most = 2 * head.size();; most *= 2) {
+    TNormalText const normal(text.substr(begin), most);
+    auto const next = spellings.upper_bound(normal.Text());
+    auto const last = next == spellings.begin() ? next : std::prev(next);
+    std::size_t const sameAsLast = SizeOfSame(normal.Text(), last->first);
+    std::size_t const sameAsNext = next == spellings.end() ? 0 : SizeOfSame(normal.Text(), next->first);
+    std::size_t const same = std::max(sameAsLast, sameAsNext);
+    if (same > most) continue;
+    std::size_t const size = normal.LastWordEnd(same);
+    auto const exact = spellings.find(normal.Text().substr(0, size));
+    auto const nearest = sameAsLast == same ? last : next;
+    return {begin, begin + normal.EndOf(size), &fSecrets[exact == spellings.end() ? nearest->second : exact->second]};
+  }
 }
 
 // Whether the text, which has the normal form of the spelling, is one: in the cases of a word of letters, and without a space
@@ -214,11 +242,16 @@ TSecretIndex::TPart const* TSecretIndex::PartIn(std::string_view word) const {
   }
 }
 
+// The longest part at that place. Each part with which the word begins, also precedes it in order, and begins a part between
+// them.
 TSecretIndex::TPart const* TSecretIndex::PartAt(std::string_view word, std::size_t at) const {
-  auto const found = fParts.find(Lower(word.substr(at, kPartSize)));
-  if (found == fParts.end()) return nullptr;
-  for (TPart const& part : found->second)
-    if (IsSame(word.substr(at, part.fText.size()), part.fText)) return &part;
+  for (std::string begin = Lower(word.substr(at, kMostPart)); begin.size() >= kPartSize;) {
+    auto const next = fParts.upper_bound(begin);
+    if (next == fParts.begin()) return nullptr;
+    auto const& [text, part] = *std::prev(next);
+    begin.resize(SizeOfSame(begin, text));
+    if (begin.size() == text.size()) return &part;
+  }
   return nullptr;
 }
 

@@ -6,6 +6,7 @@
 #include <bitset>
 #include <cstddef>
 #include <functional>
+#include <map>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -25,7 +26,8 @@ struct TSecret {
 // without digits with a space only where it has one itself.
 //
 // A secret is found where no word continues at its ends. A longer word that contains a secret of six characters or more, with a
-// digit among them, or one in base64, is a spelling of it: "enx525400112201".
+// digit among them, or one in base64, is a spelling of it: "enx525400112201". The begin of a long secret is a spelling of it,
+// too: 200 characters in whole words, or 64 in a longer word. The time for a text is thus in proportion to its length.
 class TSecretIndex {
 public:
   // Another spelling of a value that is known already (CanonicalForm) belongs to that secret.
@@ -52,10 +54,11 @@ private:
     bool fIsExact;  // whether case matters
   };
   struct TPart {
-    std::string fText;
     std::size_t fSecret;
     bool fIsBase64;
   };
+  using TParts = std::map<std::string, TPart>;
+  using TLongSpellings = std::map<std::string, std::size_t, std::less<>>;  // the secrets by their normal forms
   struct THit {
     std::size_t fBegin = 0, fEnd = 0;
     TSecret const* fSecret = nullptr;
@@ -64,10 +67,11 @@ private:
   void AddCase(std::string const& value);
   void AddSpelling(std::string const& text, TSpelling const& spelling);
   void AddBase64(std::string const& text, std::size_t secret);
-  void AddPart(TPart part);
+  void AddPart(std::string_view text, TPart const& part);
   THit HitAtWord(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const;
   THit HitAt(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const;
   THit LongestAt(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const;
+  THit LongHitAt(std::string_view text, std::size_t begin, std::string const& head) const;
   bool IsAsWritten(TSpelling const& spelling, std::string_view text) const;
   THit WithSigns(THit const& hit, std::string_view text, std::size_t from) const;
   THit WordWith(std::string_view text, std::size_t from, std::size_t begin, std::size_t end) const;
@@ -78,10 +82,11 @@ private:
   std::unordered_set<std::string> fValues;
   std::unordered_map<std::string, std::size_t> fKnown;    // the secrets by their canonical forms
   std::unordered_map<std::string, TSpelling> fSpellings;  // by their normal forms
+  std::unordered_map<std::string, TLongSpellings> fLong;  // longer ones, by the first words of their normal forms
   std::unordered_map<std::string, std::vector<std::size_t>>
-      fSizes;                                                  // of the normal forms, by their first word; the longest first
-  std::unordered_map<std::string, std::vector<TPart>> fParts;  // of longer words, by their first bytes
-  std::bitset<kHashes> fWords, fBegins;                        // hashes of the first words, and of the first bytes of parts
+      fSizes;                            // of the normal forms, or of their first words, by the first word; the longest first
+  TParts fParts;                         // of longer words, in lower case
+  std::bitset<kHashes> fWords, fBegins;  // hashes of the first words, and of the first bytes of parts
 };
 
 }  // namespace NQRVZEP20

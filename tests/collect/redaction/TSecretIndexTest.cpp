@@ -4,6 +4,8 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <ctime>
+
 namespace NQRVZEP20 {
 namespace {
 
@@ -87,6 +89,59 @@ TEST(TSecretIndexTest, ManySecretsWithTheSameFirstWordAreFoundInTime) {
   std::size_t hits = 0;
   index.Rewritten(text, [&](TSecret const*, std::string const&) { return ++hits, "X"; });
   EXPECT_EQ(hits, 5000u);
+}
+
+std::string Times(std::size_t number, std::string const& text) {
+  std::string result;
+  for (std::size_t at = 0; at < number; ++at) result += text;
+  return result;
+}
+
+TEST(TSecretIndexTest, ALongSecretIsFoundInATextAndInAWord) {
+  std::string const words = Times(20000, "a1-"), word = Times(20000, "a1B");
+  EXPECT_EQ(Without(words + "z", "on " + words + "z here"), "on X here");
+  EXPECT_EQ(Without(words + "z", "on a1-a1 here"), "on a1-a1 here");
+  EXPECT_EQ(Without(word + "z", word + "Z here, usb" + word + "z"), "X here, X");
+}
+
+TEST(TSecretIndexTest, TheBeginOfALongSecretIsASpellingOfIt) {
+  std::string const same = Times(100, "a1-");
+  EXPECT_EQ(Without(same + "z7-z8", "on " + same + "z7-y here"), "on X-y here");
+  EXPECT_EQ(Without(same + "z7-z8", "on " + same + "z77-y here"), "on X-z77-y here");
+}
+
+TEST(TSecretIndexTest, SecretsWithTheSameBeginAreDifferent) {
+  std::string const same = Times(100, "a1-");
+  TSecretIndex index;
+  for (char const* end : {"b2", "c3", "c3-d4", "c3-d4-e5-f6"}) index.Add(ESecretKind::kSerials, same + end);
+  auto const end = [&](TSecret const* secret, std::string const&) { return secret->fValue.substr(same.size()); };
+  EXPECT_EQ(index.Rewritten(same + "c3-d4 " + same + "b2 " + same + "c3", end), "c3-d4 b2 c3");
+}
+
+// Each text almost has a secret everywhere.
+TEST(TSecretIndexTest, LongSecretsAreLookedForInTime) {
+  std::string const words = Times(20000, "a1-"), word = Times(20000, "a1b");
+  std::clock_t const begin = std::clock();
+  EXPECT_EQ(Without(words + "z", Times(100, Times(60, "a1-") + "b ")), Times(100, Times(60, "a1-") + "b "));
+  EXPECT_THAT(Without(words + "z", Times(5, words)), testing::MatchesRegex("(X-)*"));
+  EXPECT_EQ(Without(word + "z", Times(5, Times(15, "a1b") + "c")), Times(5, Times(15, "a1b") + "c"));
+  EXPECT_LT((std::clock() - begin) / CLOCKS_PER_SEC, 10);
+}
+
+TEST(TSecretIndexTest, ManySecretsWithTheSameFirstBytesAreFoundInTime) {
+  TSecretIndex index;
+  std::string text;
+  std::clock_t const begin = std::clock();
+  for (int number = 0; number < 20000; ++number) {
+    index.Add(ESecretKind::kSerials, "SNQ12X" + std::to_string(100000 + number));
+    text += "usbSNQ12X" + std::to_string(300000 + number) + " usbSNQ12X" + std::to_string(100000 + number) + " ";
+  }
+  std::size_t hits = 0;
+  index.Rewritten(text, [&](TSecret const* secret, std::string const& spelling) {
+    return hits += "usb" + secret->fValue == spelling ? 1 : 0, "X";
+  });
+  EXPECT_EQ(hits, 20000u);
+  EXPECT_LT((std::clock() - begin) / CLOCKS_PER_SEC, 10);
 }
 
 }  // namespace
