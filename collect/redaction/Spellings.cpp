@@ -13,7 +13,7 @@ namespace {
 using TTexts = std::vector<std::string>;
 
 constexpr std::size_t kShortestHex = 8, kUuidDigits = 32;
-constexpr std::size_t kShortestBase64 = 6;  // shorter values have forms that are common words
+constexpr std::size_t kShortestBase64 = 6;  // fewer bytes have forms that are common words
 
 // The digits with a mark after each group: "52-54-00" for a size of 2.
 std::string Grouped(std::string_view digits, std::size_t size) {
@@ -38,12 +38,24 @@ std::string Reversed(std::string_view digits) {
   return reversed;
 }
 
-// The digits, also in groups of one and two bytes.
+// Each byte with the same text before it: "%52%54".
+std::string Prefixed(std::string_view digits, std::string_view prefix) {
+  std::string text;
+  for (std::size_t at = 0; at < digits.size(); at += 2) text.append(prefix).append(digits.substr(at, 2));
+  return text;
+}
+
+// The digits, also in groups of one, two and four bytes, and each byte as a number.
 void AddHex(TTexts& texts, std::string const& digits) {
   texts.push_back(digits);
   texts.push_back("0x" + digits);
-  texts.push_back(Grouped(digits, 2));
-  texts.push_back(Grouped(digits, 4));
+  for (std::size_t const size : {2, 4, 8}) texts.push_back(Grouped(digits, size));
+  texts.push_back(Prefixed(digits, " 0x"));
+}
+
+// All characters as escapes, whether or not they need it.
+void AddEscaped(TTexts& texts, std::string const& digits) {
+  for (char const* prefix : {"%", "\\x", "\\u00"}) texts.push_back(Prefixed(digits, prefix));
 }
 
 void AddUuid(TTexts& texts, std::string const& digits) {
@@ -57,7 +69,7 @@ void AddUuid(TTexts& texts, std::string const& digits) {
   }
 }
 
-// The address as the kernel's tables write it, and in its other notations.
+// The address as the kernel's tables write it, and in its other notations, also those of the domain name system.
 void AddAddress(TTexts& texts, std::string const& value) {
   in6_addr bytes{};
   char notation[INET6_ADDRSTRLEN];
@@ -65,10 +77,17 @@ void AddAddress(TTexts& texts, std::string const& value) {
     std::string const digits = HexOf({reinterpret_cast<char const*>(&bytes), sizeof(in_addr)});
     texts.push_back(digits);
     texts.push_back(Reversed(digits));
+    auto const* const bytesInOrder = reinterpret_cast<unsigned char const*>(&bytes);
+    std::string name = "in-addr.arpa";
+    for (std::size_t at = 0; at < sizeof(in_addr); ++at) name = std::to_string(bytesInOrder[at]) + "." + name;
+    texts.push_back(name);
   } else if (::inet_pton(AF_INET6, value.c_str(), &bytes) == 1) {
     std::string const digits = HexOf({reinterpret_cast<char const*>(&bytes), sizeof bytes});
     texts.push_back(digits);
     texts.push_back(Grouped(digits, 4));
+    std::string name = "ip6.arpa";
+    for (char const digit : digits) name = std::string(1, digit) + "." + name;
+    texts.push_back(name);
     texts.emplace_back(::inet_ntop(AF_INET6, &bytes, notation, sizeof notation));
   }
 }
@@ -80,6 +99,23 @@ std::string Utf16(std::string_view value) {
     text += '\0';
   }
   return text;
+}
+
+// The same with the high byte first.
+std::string Utf16BigEndian(std::string_view value) {
+  std::string text;
+  for (char const byte : value) {
+    text += '\0';
+    text += byte;
+  }
+  return text;
+}
+
+// "DC=example,DC=net" for "example.net", as directory services write it.
+void AddDirectoryName(TTexts& texts, std::string_view value) {
+  std::string name = "DC=";
+  for (char const byte : value) name += byte == '.' ? ",DC=" : std::string(1, byte);
+  if (value.find('.') != value.npos) texts.push_back(name);
 }
 
 // The characters of the base64 form that depend on the value alone, where `skipped` bytes precede it.
@@ -123,6 +159,9 @@ std::string DigitsOf(std::string_view value) {
 std::vector<std::string> SpellingsOf(std::string_view value) {
   TTexts texts = {std::string(value), Lower(Compact(value)), PercentEncoded(value), Utf16(value), HexOf(Utf16(value))};
   AddHex(texts, HexOf(value));
+  AddHex(texts, HexOf(Utf16BigEndian(value)));
+  AddEscaped(texts, HexOf(value));
+  AddDirectoryName(texts, value);
   std::string const digits = DigitsOf(value);
   if (!digits.empty()) AddHex(texts, digits);
   if (digits.size() == kUuidDigits) AddUuid(texts, digits);
@@ -132,8 +171,9 @@ std::vector<std::string> SpellingsOf(std::string_view value) {
 
 std::vector<std::string> Base64Of(std::string_view value) {
   TTexts texts;
-  if (value.size() >= kShortestBase64)
-    for (std::size_t skipped = 0; skipped < 3; ++skipped) texts.push_back(Base64(value, skipped));
+  for (std::string const& bytes : {std::string(value), Utf16(value), Utf16BigEndian(value)})
+    for (std::size_t skipped = 0; bytes.size() >= kShortestBase64 && skipped < 3; ++skipped)
+      texts.push_back(Base64(bytes, skipped));
   return texts;
 }
 
