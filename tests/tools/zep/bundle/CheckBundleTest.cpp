@@ -166,6 +166,13 @@ TEST_F(CheckBundleTest, AManifestThatIsNotSoundIsRefused) {
       {"\"signed\"", "\"x\"", "manifest.json is not sound: [json.exception.out_of_range.403] key 'signed' not found"},
       {"\"bundleVersion\": 1", "\"bundleVersion\": 2",
        "it is a bundle of the version 2, written by zep " ZEP_VERSION "; this zep reads only the version 1"},
+      {"\"bundleVersion\": 1", "\"bundleVersion\": 4294967297",
+       "it is a bundle of the version 4294967297, written by zep " ZEP_VERSION "; this zep reads only the version 1"},
+      {"\"bundleVersion\": 1", "\"bundleVersion\": 1.9",
+       "it is a bundle of the version 1.9, written by zep " ZEP_VERSION "; this zep reads only the version 1"},
+      {"\"bundleVersion\": 1", "\"bundleVersion\": true",
+       "it is a bundle of the version true, written by zep " ZEP_VERSION "; this zep reads only the version 1"},
+      {"\"time\": \"2", "\"time\": \"x", "manifest.json is not sound: its time is invalid"},
   };
   for (TRow const& row : rows) {
     TParts parts = PartsOf(Good());
