@@ -152,6 +152,12 @@ void ForEachRedactedNumber(TJson& document, TUse use) {
   }
 }
 
+ESecretKind KnownKind(std::string const& name) {
+  auto const kind = SecretKindFrom(name);
+  if (!kind) throw TRedactionError("/redaction/kinds: has another element than serials, hosts, addresses and users");
+  return *kind;
+}
+
 TJson MemberFor(TKinds const& kinds, std::string const& map, TJson const& spellings) {
   TJson names = TJson::array();
   for (ESecretKind const kind : kinds) names.push_back(NameOf(kind));
@@ -174,7 +180,7 @@ TRedactedWith RedactedWith(TJson const& document) {
   try {
     TRedactedWith result{{}, document.at(kRedaction).at("map")};
     for (TJson const& name : document.at(kRedaction).at("kinds").get_ref<TJson::array_t const&>())
-      if (auto const kind = SecretKindFrom(name.get_ref<std::string const&>())) result.fKinds.push_back(*kind);
+      result.fKinds.push_back(KnownKind(name.get_ref<std::string const&>()));
     return result;
   } catch (TJson::exception const&) {
     throw TRedactionError("/redaction: has no kinds and no map");

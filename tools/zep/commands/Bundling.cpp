@@ -2,6 +2,7 @@
 #include "tools/zep/commands/Bundling.h"
 
 #include "collect/FailureOf.h"
+#include "collect/redaction/Redaction.h"
 #include "collect/stored/StoredReport.h"
 #include "tools/zep/bundle/CollectorLog.h"
 #include "tools/zep/html/ReportHtml.h"
@@ -119,8 +120,10 @@ TEvidence EvidenceOfStored() {
 // ---- The bundle ----
 
 std::vector<std::string> RedactedKinds(TJson const& document) {
-  auto const redaction = document.find("redaction");
-  return redaction == document.end() ? std::vector<std::string>() : redaction->at("kinds").get<std::vector<std::string>>();
+  std::vector<std::string> names;
+  if (!IsRedacted(document)) return names;
+  for (ESecretKind const kind : RedactedWith(document).fKinds) names.push_back(NameOf(kind));
+  return names;
 }
 
 TBundleManifest WriteBundle(TBundleArguments const& arguments, std::string const& text, std::vector<std::string> const& redacted,

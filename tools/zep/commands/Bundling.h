@@ -60,7 +60,7 @@ private:
 // The evidence of a stored report.
 TEvidence EvidenceOfStored();
 
-// The kinds of secrets that are redacted in the document of a report.
+// The kinds of secrets that are redacted in the document of a report. Throws TRedactionError if it does not have them.
 std::vector<std::string> RedactedKinds(TJson const& document);
 
 // Packs, signs and writes the bundle of the report whose document has this text, and returns its manifest. Throws like

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "tools/zep/commands/StoredReports.h"
 
+#include "collect/redaction/Redaction.h"
 #include "collect/stored/StoredDocument.h"
 #include "tools/zep/html/DifferencesHtml.h"
 #include "tools/zep/html/ReportHtml.h"
@@ -20,9 +21,23 @@ TStoredReport ReadReport(std::string const& file) {
   }
 }
 
+namespace {
+
+// The document of a redacted report names the kinds of secrets and the map.
+void CheckRedaction(TJson const& document, std::string const& file) {
+  try {
+    if (IsRedacted(document)) RedactedWith(document);
+  } catch (TRedactionError const& failure) {
+    throw TFailure(kExitNoInput, file + ": " + failure.what());
+  }
+}
+
+}  // namespace
+
 TJson ReadDocument(std::string const& file, TRedactionArguments const& redaction) {
   try {
     TJson document = ReadStoredDocument(file);
+    CheckRedaction(document, file);
     if (redaction.IsWanted()) RedactDocument(document, redaction);
     return document;
   } catch (TStoredReportError const& failure) {

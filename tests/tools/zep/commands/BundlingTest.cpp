@@ -110,6 +110,17 @@ TEST_F(BundlingTest, ABundleIsVerifiedWithTheOrdinaryTools) {
     EXPECT_THAT(Names(Verified({option, other.fCertificateFile}, 1)["differences"], "member"), ElementsAre("manifest.p7s"));
 }
 
+TEST_F(BundlingTest, AStoredReportWithAnotherRedactionIsRefused) {
+  for (char const* redaction : {R"({"kinds":[5],"map":"a"})", R"({"kinds":["foo"],"map":"a"})", R"({"map":"a"})", "[1]", "5"}) {
+    auto document = nlohmann::ordered_json::parse(StoredDocument());
+    document["redaction"] = nlohmann::ordered_json::parse(redaction);
+    WriteFile(Work("a.json"), document.dump());
+    TRun const run = Run({"report", "--from", "a.json", "--bundle", "b.tar.zst"});
+    EXPECT_EQ(run.fStatus, 66) << redaction;
+    EXPECT_THAT(run.fErrors, StartsWith("zep: a.json: /redaction")) << redaction;
+  }
+}
+
 TEST_F(BundlingTest, ABundleThatWasRepackedIsNotRight) {
   Run({"report", "--sample", "--bundle", "b.tar.zst"});
   Shell(
