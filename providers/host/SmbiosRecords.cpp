@@ -28,16 +28,17 @@ TFinding<std::string> UuidFrom(std::vector<unsigned char> const& u) {
 
 // The first three fields are little-endian since version 2.6 of the standard; before, they have the printed order.
 TFinding<std::string> UuidOf(TSmbiosStructure const& system, TFinding<std::optional<TSmbiosVersion>> const& version) {
+  auto const stored = system.Bytes(0x08, 16);
+  if (!stored) return stored.Why();
   if (!version) return TMissing{version.Why().fCode, "the byte order is unknown: " + version.Why().fReason};
   bool const isLittleEndian = !*version || **version >= TSmbiosVersion(2, 6);
-  return system.Bytes(0x08, 16).Then([isLittleEndian](std::vector<unsigned char> bytes) {
-    if (isLittleEndian) {
-      std::reverse(bytes.begin(), bytes.begin() + 4);
-      std::reverse(bytes.begin() + 4, bytes.begin() + 6);
-      std::reverse(bytes.begin() + 6, bytes.begin() + 8);
-    }
-    return UuidFrom(bytes);
-  });
+  std::vector<unsigned char> bytes = *stored;
+  if (isLittleEndian) {
+    std::reverse(bytes.begin(), bytes.begin() + 4);
+    std::reverse(bytes.begin() + 4, bytes.begin() + 6);
+    std::reverse(bytes.begin() + 6, bytes.begin() + 8);
+  }
+  return UuidFrom(bytes);
 }
 
 // ---- BIOS ----

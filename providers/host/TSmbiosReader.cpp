@@ -4,6 +4,8 @@
 #include "loaders/SmbiosLibrary.h"
 
 #include <cstdlib>
+#include <cstring>
+#include <optional>
 #include <system_error>
 
 namespace NQRVZEP20 {
@@ -27,6 +29,8 @@ std::string Reason(int status, int error) {
   return status == kSmbiosFileSystemError && error != 0 ? ": " + std::generic_category().message(error) : "";
 }
 
+std::string const kSystemTables = "the system's SMBIOS tables";
+
 TMissing const kNeedsRoot{kMissingNeedsRoot, "only root can read the SMBIOS tables"};
 
 // The path at which libsmbios.so reads the kernel's tables. The entry point beside them is read there, too.
@@ -35,11 +39,16 @@ std::string KernelFile(TMachineFiles const& files) {
   return files.Outside(kKernelTable);
 }
 
-// The library does not know the marks of a recording.
-bool IsRefusedInRecording(TMachineFiles const& files, std::string const& namedFile) {
-  if (!namedFile.empty() || (files.IsThisMachine() && !files.IsBeingRecorded())) return false;
+// Why a recording has no tables; none if it has them. libsmbios.so does not know the marks of a recording, and would read one as
+// a table. The reason is that of the recorded machine (WhyTablesFailed).
+std::optional<TMissing> WhyNotInRecording(TMachineFiles const& files, std::string const& namedFile) {
+  if (!namedFile.empty() || (files.IsThisMachine() && !files.IsBeingRecorded()) || !files.Exists(kKernelTable))
+    return std::nullopt;
   auto const start = files.Bytes(kKernelTable, 0, 1);
-  return !start && start.Why().fCode == kMissingNeedsRoot;
+  if (start) return std::nullopt;
+  if (start.Why().fCode == kMissingNeedsRoot) return kNeedsRoot;
+  std::string const& reason = start.Why().fReason;  // begins with the path: "... cannot be read: Input/output error"
+  return TMissing{kMissingUnreadable, kSystemTables + reason.substr(std::strlen(kKernelTable))};
 }
 
 TMissing WhyNotLoaded(TLoadOutcome const& outcome) {
@@ -60,7 +69,7 @@ TMissing WhyTablesFailed(TSmbiosTables const& tables, std::string const& tableFi
   }
   if (status == kSmbiosFileNotFound) return {kMissingNoTables, "the system exports no SMBIOS tables"};
   if (status == kSmbiosAccessDenied) return kNeedsRoot;
-  return {kMissingUnreadable, "the system's SMBIOS tables cannot be read" + Reason(status, error)};
+  return {kMissingUnreadable, kSystemTables + " cannot be read" + Reason(status, error)};
 }
 
 // The structure that `get` copies; empty when it copies none.
@@ -113,9 +122,13 @@ TSmbiosReader::TSmbiosReader(TMachineFiles const& files) : fNamedFile(NamedFile(
   fTables = std::make_unique<TSmbiosTables>(TSmbiosTables::kClosedWithTables);
   if (!fTables->Library())
     fWhyNot = WhyNotLoaded(fTables->Library());
-  else if (!fTables->HasHandle())
-    fWhyNot = IsRefusedInRecording(files, fNamedFile) ? kNeedsRoot : WhyTablesFailed(*fTables, fNamedFile);
-  if (!fTables->HasHandle()) fTables.reset();
+  else if (auto const why = WhyNotInRecording(files, fNamedFile))
+    fWhyNot = *why;
+  else if (fTables->HasHandle())
+    return;
+  else
+    fWhyNot = WhyTablesFailed(*fTables, fNamedFile);
+  fTables.reset();
 }
 
 TSmbiosReader::~TSmbiosReader() = default;

@@ -2,16 +2,21 @@
 #include "providers/host/TSmbiosReader.h"
 
 #include "core/Handles.h"
+#include "providers/reasons/RecordedMark.h"
 #include "tests/SmbiosTables.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <sys/resource.h>
+#include <sys/stat.h>
 
+#include <filesystem>
 #include <memory>
 
 namespace NQRVZEP20 {
 namespace {
+
+namespace fs = std::filesystem;
 
 using testing::ElementsAre;
 using testing::IsEmpty;
@@ -115,6 +120,29 @@ TEST_F(TSmbiosReaderTest, TheSourceMarksATableFile) {
   EXPECT_EQ(fReader->SourceOf(17), "SMBIOS type 17 (file)");
   ReadFrom("");
   EXPECT_EQ(fReader->SourceOf(17), "SMBIOS type 17");
+}
+
+// A mark of a recording (RecordedMark.h) is not a table: the reason is the one of the recorded machine.
+TEST_F(TSmbiosReaderTest, ARefusalInARecordingIsTheReason) {
+  struct TRow {
+    char const *fMark, *fCode, *fReason;
+  } const rows[] = {
+      {"refused 13 user", "needs-root", "only root can read the SMBIOS tables"},
+      {"refused 5 root", "unreadable", "the system's SMBIOS tables cannot be read: Input/output error"},
+  };
+  std::string const table = fDir.Path("sys/firmware/dmi/tables/DMI");
+  fs::create_directories(fs::path(table).parent_path());
+  TEnvironmentGuard const root("ZEP_ROOT", fDir.Path().c_str());
+  for (TRow const& row : rows) {
+    SCOPED_TRACE(row.fMark);
+    WriteFile(table, row.fMark);
+    ASSERT_EQ(::chmod(table.c_str(), kMarkMode & 07777), 0);
+    ReadFrom("");
+    EXPECT_EQ(fReader->WhyNone(1).fCode, row.fCode);
+    EXPECT_EQ(fReader->WhyNone(1).fReason, row.fReason);
+    EXPECT_THAT(fReader->All(17), IsEmpty());
+    fs::remove(table);
+  }
 }
 
 TEST_F(TSmbiosReaderTest, TheRealTablesHaveTheirStructures) {

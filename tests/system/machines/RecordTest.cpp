@@ -3,6 +3,7 @@
 // zep record and zep report --replay with all providers of this project, on a recorded machine and on this one.
 
 #include "tests/Machines.h"
+#include "tests/tools/zep/Timing.h"
 #include "tests/tools/zep/Zep.h"
 
 #include <gmock/gmock.h>
@@ -12,12 +13,6 @@
 
 namespace NQRVZEP20::zep {
 namespace {
-
-// Without the collector's own timing.
-std::string WithoutTiming(std::string const& document) {
-  std::string const timed = std::regex_replace(document, std::regex("\"time\": \"[^\"]*\""), "\"time\": N");
-  return std::regex_replace(timed, std::regex("\"milliseconds\": [0-9.e+-]+"), "\"milliseconds\": N");
-}
 
 class RecordTest : public testing::Test {
 protected:
