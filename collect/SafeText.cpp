@@ -8,12 +8,13 @@ namespace NQRVZEP20 {
 
 namespace {
 
-// Characters that a terminal acts upon, or that show text other than it is.
+// Characters that a terminal acts upon, or that show text other than it is, and codes that no text may contain.
 bool IsHarmful(std::uint32_t code) {
   bool const isControl = code < 0x20 || (code >= 0x7f && code < 0xa0);
   bool const isDirection = code == 0x061c || (code >= 0x200b && code <= 0x200f) || (code >= 0x2028 && code <= 0x202e) ||
                            (code >= 0x2060 && code <= 0x206f) || code == 0xfeff;
-  return isControl || isDirection;
+  bool const isNoCharacter = (code >= 0xfdd0 && code <= 0xfdef) || (code & 0xfffe) == 0xfffe;  // by the Unicode standard
+  return isControl || isDirection || isNoCharacter;
 }
 
 std::string Escaped(std::uint32_t code) {

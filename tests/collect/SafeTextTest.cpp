@@ -30,6 +30,8 @@ TEST(SafeTextTest, CharactersThatControlATerminalAreEscaped) {
        "a\\u200b"
        "b"},  // has no width
       {"\xef\xbb\xbf", "\\ufeff"},
+      {"\xef\xbf\xbe\xef\xb7\x90", "\\ufffe\\ufdd0"},  // not characters
+      {"\xf0\x9f\xbf\xbf", "\\u1ffff"},
       {"\xff\xfe", "\\xff\\xfe"},
       {"\xc3", "\\xc3"},  // cut
       {"\xc3(", "\\xc3("},

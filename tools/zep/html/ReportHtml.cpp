@@ -115,9 +115,11 @@ std::string RowsAsCard(std::string const& id, std::string const& title, std::vec
 
 std::string TextOf(TText const& cell) { return cell.IsKnown() ? *cell.fValue : ""; }
 
-std::string SectionAsCard(TReportSection const& section) {
-  if (section.fRows.empty())
-    return Card(section.fKey, section.fTitle, "<p class=\"none\">none: " + Html(section.fWhyEmpty) + "</p>\n");
+// The keys of a stored report may be any text, and not unique.
+std::string IdOfSection(std::size_t at) { return "section-" + std::to_string(at + 1); }
+
+std::string SectionAsCard(std::string const& id, TReportSection const& section) {
+  if (section.fRows.empty()) return Card(id, section.fTitle, "<p class=\"none\">none: " + Html(section.fWhyEmpty) + "</p>\n");
   std::vector<std::vector<TText>> rows = section.fRows;
   std::stable_sort(rows.begin(), rows.end(), [](auto const& one, auto const& other) {
     return !one.empty() && ::strverscmp(TextOf(one.front()).c_str(), TextOf(other.front()).c_str()) < 0;
@@ -128,7 +130,7 @@ std::string SectionAsCard(TReportSection const& section) {
     for (TText const& cell : row) cells.push_back(Cell(cell));
     html += RowWith(cells);
   }
-  return Card(section.fKey, section.fTitle, Table(section.fTitle, section.fColumns, html));
+  return Card(id, section.fTitle, Table(section.fTitle, section.fColumns, html));
 }
 
 std::string PlugIns(TStoredReport const& report) {
@@ -195,7 +197,8 @@ std::string Link(std::string const& id, std::string const& title, std::size_t co
 std::string Contents(TStoredReport const& report) {
   std::string links =
       Link("findings", "Findings", report.fProblems.size()) + Link("identity", "Identity", 0) + Link("details", "Details", 0);
-  for (TReportSection const& section : report.fSections) links += Link(section.fKey, section.fTitle, section.fRows.size());
+  for (std::size_t at = 0; at < report.fSections.size(); ++at)
+    links += Link(IdOfSection(at), report.fSections[at].fTitle, report.fSections[at].fRows.size());
   links += Link("plug-ins", "Plug-ins", 0) + Link("objects", "All objects", 0);
   return "<nav aria-label=\"Contents\"><h2>Contents</h2>\n<ul>\n" + links + "</ul></nav>\n";
 }
@@ -211,7 +214,7 @@ std::string ReportAsHtml(TStoredReport const& report) {
   std::string body = "<a class=\"skip\" href=\"#findings\">Skip to the findings</a>\n" + Header(report) +
                      "<div class=\"page\">\n" + Contents(report) + "<main>\n" + Findings(report) +
                      RowsAsCard("identity", "Identity", report.fIdentity) + RowsAsCard("details", "Details", report.fDetails);
-  for (TReportSection const& section : report.fSections) body += SectionAsCard(section);
+  for (std::size_t at = 0; at < report.fSections.size(); ++at) body += SectionAsCard(IdOfSection(at), report.fSections[at]);
   body += PlugIns(report) + Objects(report) + "</main>\n</div>\n<footer>Written by zep " + Html(report.fZep) + "</footer>\n";
   return HtmlPage(report.fHead.empty() ? "Machine report" : report.fHead.front(), body);
 }

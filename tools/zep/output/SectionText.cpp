@@ -43,9 +43,9 @@ std::vector<std::size_t> WidthsFor(TRows const& rows) {
 }  // namespace
 
 std::string SectionAsText(TReportSection const& section, std::string const& label, std::size_t limit) {
-  std::string const title = label + section.fTitle;
+  std::string const title = Printable(label + section.fTitle);
   if (section.fRows.empty())
-    return Joined(Wrapped(Printable(title + ": none (" + section.fWhyEmpty + ")"), OutputWidth()), "\n") + "\n";
+    return Joined(Wrapped(title + ": none (" + Printable(section.fWhyEmpty) + ")", OutputWidth()), "\n") + "\n";
 
   std::size_t const count = limit == 0 ? section.fRows.size() : std::min(limit, section.fRows.size());
   TRows const rows = TextRows(section, count);
@@ -53,7 +53,8 @@ std::string SectionAsText(TReportSection const& section, std::string const& labe
   for (auto const& row : rows) table.Add(row);
   std::string const text = title + "\n" + table.GetText();
   if (count == section.fRows.size()) return text;
-  return text + "and " + std::to_string(section.fRows.size() - count) + " more: zep report --section " + section.fKey + "\n";
+  return text + "and " + std::to_string(section.fRows.size() - count) + " more: zep report --section " + Printable(section.fKey) +
+         "\n";
 }
 
 }  // namespace NQRVZEP20::zep

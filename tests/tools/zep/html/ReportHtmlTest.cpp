@@ -45,6 +45,11 @@ TEST(ReportHtmlTest, EveryLinkOfTheContentsLeadsToAPart) {
   EXPECT_EQ(Matches(page, "href=\"#([^\"]*)\""), Matches(page, " id=\"([^\"]*)\""));
 }
 
+TEST(ReportHtmlTest, TheKeyOfASectionIsNotAnId) {
+  std::string const page = PageOf(StoredDocumentWith(R"("key": "memory")", R"("key": "a b findings")"));
+  for (std::string const& id : Matches(page, " id=\"([^\"]*)\"")) EXPECT_THAT(id, testing::MatchesRegex("[a-z0-9-]+"));
+}
+
 TEST(ReportHtmlTest, RelationsAndMissingValuesAreOmitted) {
   EXPECT_THAT(PageOf(StoredDocument()), Not(HasSubstr("CIM_Realizes")));
 }

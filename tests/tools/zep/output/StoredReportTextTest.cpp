@@ -17,6 +17,13 @@ TEST(StoredReportTextTest, HasTheHeadTheProblemsTheRowsAndTheTables) {
     EXPECT_THAT(text, testing::HasSubstr(part));
 }
 
+TEST(StoredReportTextTest, TheTitleOfASectionDoesNotReachTheTerminalRaw) {
+  std::string const document = StoredDocumentWith(R"("title": "Memory modules")", R"("title": "Disks\u001b]0;own\u0007\u202e")");
+  std::string const text = StoredReportAsText(StoredReportFrom(document, "a.json"));
+  EXPECT_THAT(text, testing::HasSubstr(R"(Disks\x1b]0;own\x07\u202e)"));
+  EXPECT_THAT(text, testing::Not(testing::HasSubstr("\x1b")));
+}
+
 // With the words of a report on this machine.
 TEST(StoredReportTextTest, SaysWhichRulesHadNothingToExamine) {
   std::string const idle = StoredDocumentWith(R"("outcome": "wrong", "examined": 1,)", R"("outcome": "fine", "examined": 0,)");
