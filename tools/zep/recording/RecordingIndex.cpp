@@ -54,6 +54,7 @@ std::string TimeIn(TJson const& json) {
 }
 
 TThresholds ThresholdsFrom(TJson const& json) {
+  if (!json.is_object()) ThrowUnsound("the thresholds are not an object");
   try {
     return TThresholds::From([&](std::string const& key) {
       auto const value = json.find(key);

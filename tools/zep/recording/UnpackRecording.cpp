@@ -82,9 +82,16 @@ private:
       mode_t const mode = expected.fMark.empty() ? kFileMode : kMarkMode & 07777;
       if (!file || !WriteWhole(file.get(), content) || ::fchmod(file.get(), mode) != 0) ThrowUnwritten(expected.fMember.fName);
     }
-    if (Sha256Of(path) == expected.fSha256) return;
+    bool const isSumRight = Sha256Of(path) == expected.fSha256;
     ThrowIfInterrupted();
-    throw TArchiveError("its member " + Printable(expected.fMember.fName) + " was altered: its SHA-256 differs");
+    if (!isSumRight) ThrowAltered(expected, "SHA-256");
+    if (content.size() != expected.fBytes) ThrowAltered(expected, "size");
+    if (!expected.fMark.empty() && Printable(content) != expected.fMark) ThrowAltered(expected, "mark");
+  }
+
+  // `difference`: the member of the index that is not that of the file.
+  [[noreturn]] static void ThrowAltered(TRecordedMember const& expected, std::string const& difference) {
+    throw TArchiveError("its member " + Printable(expected.fMember.fName) + " was altered: its " + difference + " differs");
   }
 
   void MakeLink(TMember const& link) const {

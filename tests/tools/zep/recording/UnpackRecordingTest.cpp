@@ -84,6 +84,8 @@ TEST_F(UnpackRecordingTest, AChangedRecordingIsRefusedByNameAndPlace) {
   } const rows[] = {
       {"its member root/a was altered: its SHA-256 differs", [](TRecorded& r) { r.fParts[1].fContent = "jello\n"; }},
       {"its member root/a was altered: its SHA-256 differs", [](TRecorded& r) { r.fParts[1].fContent = "hell"; }},
+      {"its member root/a was altered: its size differs", [](TRecorded& r) { r.fIndex.fMembers[1].fBytes = 7; }},
+      {"its member root/a was altered: its mark differs", [](TRecorded& r) { r.fIndex.fMembers[1].fMark = "listed"; }},
       {"its member root/a is longer than 6 bytes", [](TRecorded& r) { r.fParts[1].fContent = "hello\n\n"; }},
       {"its member root/a was altered",
        [](TRecorded& r) {
@@ -131,6 +133,13 @@ TEST_F(UnpackRecordingTest, AChangedRecordingIsRefusedByNameAndPlace) {
     row.fChange(recorded);
     EXPECT_EQ(WhyRefused(Packed(recorded)), row.fWhy);
   }
+}
+
+TEST_F(UnpackRecordingTest, ThresholdsAreAnObject) {
+  auto index = nlohmann::json::parse(TextOf(GoodRecording().fIndex));
+  index["thresholds"] = {1};
+  EXPECT_EQ(WhyRefused(Packed(index.dump(), GoodRecording().fParts)),
+            "recording.json is not sound: the thresholds are not an object");
 }
 
 TEST_F(UnpackRecordingTest, ANewerRecordingSaysSo) {
