@@ -5,6 +5,7 @@
 #include "collect/redaction/Redaction.h"
 #include "collect/stored/StoredReport.h"
 #include "tools/zep/bundle/CollectorLog.h"
+#include "tools/zep/commands/Thresholds.h"
 #include "tools/zep/html/ReportHtml.h"
 #include "tools/zep/output/OutputFile.h"
 #include "tools/zep/output/Text.h"
@@ -80,6 +81,7 @@ TEvidenceReading::TEvidenceReading(std::string const& replayed, std::string cons
 }
 
 TEvidence TEvidenceReading::Finish(std::vector<TPlugIn> const& plugIns) {
+  if (fRecorder) fRecorder->CheckNothingIsLost();
   TEvidence evidence;
   evidence.fMaking = "made by zep " ZEP_VERSION " from the answers of " + NamesOf(plugIns) +
                      (fReplayed.empty() ? "" : ", which read a recording");
@@ -97,7 +99,7 @@ void TEvidenceReading::AddRecording(TEvidence& evidence, std::vector<TPlugIn> co
   if (!fWhyNot.empty()) {
     evidence.fMissing.push_back({kRecordingPiece, fWhyNot});
   } else if (fRecorder) {
-    TRecorder::TResult result = fRecorder->Finish(plugIns);
+    TRecorder::TResult result = fRecorder->Finish(plugIns, ThresholdSettings());
     if (result.fIndex.fPlugIns.empty()) throw std::runtime_error("no plug-in was recorded");
     for (TNotRecorded const& row : result.fIndex.fNotRecorded) {
       evidence.fMissing.push_back({std::string(kRecordingPiece) + " of " + row.fFile, row.fReason});

@@ -47,7 +47,8 @@ public:
   // `replayed`: the recording that the plug-ins read; empty for this machine. `whyNoRecording`: not empty if there shall be none.
   TEvidenceReading(std::string const& replayed, std::string const& whyNoRecording);
 
-  // Throws TFailure after an interrupt. A recording that fails is missing.
+  // Throws TFailure after an interrupt, and with kExitNotWritten if the temporary directory is full, because the report then
+  // lacks what could not be recorded. A recording that fails otherwise is missing.
   TEvidence Finish(std::vector<TPlugIn> const& plugIns);
 
 private:

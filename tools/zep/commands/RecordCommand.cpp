@@ -59,9 +59,11 @@ std::string ReasonOf(TRecordingIndex const& index) {
 
 std::string TextAbout(std::string const& file, TRecordingIndex const& index, std::size_t size) {
   TMemberCounts const counts = CountsOf(index);
-  std::string text = "The recording " + Printable(file) + " has " + std::to_string(counts.fFiles) + " files and answers with " +
-                     std::to_string(counts.fBytes) + " bytes, compressed to " + std::to_string(size) + ", and " +
-                     std::to_string(counts.fRefused) + " refusals.\n";
+  std::string text =
+      "The recording " + Printable(file) + " has " + std::to_string(counts.fFiles) + " files and answers with " +
+      std::to_string(counts.fBytes) + " bytes, compressed to " + std::to_string(size) + ", and " +
+      std::to_string(counts.fRefused) +
+      " refusals.\nIt contains the kernel's command line and the mounts as they are, passwords in them included.\n";
   for (TNotRecorded const& row : index.fNotRecorded) text += "Not recorded: " + Printable(row.fFile + ": " + row.fReason) + "\n";
   return text;
 }
@@ -111,8 +113,9 @@ TRun AddRecordArguments(CLI::App& command) {
   AddPlugInOptions(command, arguments->fPlugIns);
   command.footer(
       "The recording has what the plug-ins read: firmware tables, files of the kernel, the output of programs and the\n"
-      "answers of the management controller, but no passwords. It identifies the machine and its hardware: pass it on only\n"
-      "to those who may see that. Only its owner can read the file.\n\n"
+      "answers of the management controller. It has them unchanged: passwords, too, that are parameters of the kernel or\n"
+      "options of a mount. It identifies the machine and its hardware: pass it on only to those who may see that. Only its owner "
+      "can read the file.\n\n"
       "Exit status: 0 when all plug-ins were recorded, 2 when some were not, 1 when none was or the recording is too large,\n"
       "64 for wrong usage, 73 when the file cannot be written.");
   return [arguments] { return Record(*arguments); };

@@ -125,7 +125,7 @@ TRun AddReportArguments(CLI::App& command) {
       "could not be mounted, written or unmounted, 64 for wrong usage; when the report could not be sent, the exit status\n"
       "of zep send; 2 when a bundle lacks a recording that could not be made. With --from it is that of the stored report,\n"
       "with --since that of zep diff; 66 when the stored report, the recording, or the key of --sign is refused, 73 when the\n"
-      "page or the bundle cannot be written.");
+      "page or the bundle cannot be written, or the temporary directory is full.");
   return [arguments] {
     if (!arguments->fFrom.empty()) return ReportFrom(*arguments);
     return arguments->fSince.empty() ? Report(*arguments) : ReportSince(*arguments);

@@ -80,15 +80,19 @@ void AddMembers(TRecordingIndex& index, fs::path const& root) {
             [](auto const& one, auto const& other) { return one.fMember.fName < other.fMember.fName; });
 }
 
-// A plug-in that reads through TMachineFiles leaves a note: an empty file of its name, which is writable if something that it
-// read is missing (TMachineCopy.h). Returns why the plug-in was not recorded, or an empty text.
+// A plug-in that reads through TMachineFiles leaves a note in this directory: an empty file of its name, which is writable if
+// something that it read is missing (TMachineCopy.h).
+constexpr char const* kNotes = "zep-plug-ins";
+
+constexpr char const* kNotAllWritten =
+    "what it reads could not be written to the temporary directory; free space in it, or name another directory in TMPDIR";
+
+bool HasLoss(struct stat const& note) { return (note.st_mode & S_IWUSR) != 0; }
+
+// Returns why the plug-in was not recorded, or an empty text.
 std::string WhyNotRecorded(TPlugIn const& plugIn, fs::path const& note) {
   struct stat status {};
-  if (::stat(note.c_str(), &status) == 0)
-    return (status.st_mode & S_IWUSR) == 0
-               ? ""
-               : "what it reads could not be written to the temporary directory; free space in it, or "
-                 "name another directory in TMPDIR";
+  if (::stat(note.c_str(), &status) == 0) return HasLoss(status) ? kNotAllWritten : "";
   if (!plugIn.fError.empty()) return plugIn.fError;
   return "it does not read through TMachineFiles of zepcore, so its reading cannot be recorded";
 }
@@ -96,7 +100,7 @@ std::string WhyNotRecorded(TPlugIn const& plugIn, fs::path const& note) {
 void NamePlugIns(TRecordingIndex& index, fs::path const& root, std::vector<TPlugIn> const& plugIns) {
   for (TPlugIn const& plugIn : plugIns) {
     std::string const name = fs::path(plugIn.fFile).filename().string();
-    std::string const why = WhyNotRecorded(plugIn, root / "zep-plug-ins" / name);
+    std::string const why = WhyNotRecorded(plugIn, root / kNotes / name);
     if (why.empty())
       index.fPlugIns.push_back(name);
     else
@@ -122,6 +126,16 @@ TRecorder::TRecorder()
                   {"ZEP_SMBIOS_TABLE", ""},
                   {"ZEP_HOST_NAME", ""},
                   {"ZEP_SCSI_DEVICES", ""}}) {}
+
+void TRecorder::CheckNothingIsLost() const {
+  std::error_code none;
+  for (fs::directory_entry const& note : fs::directory_iterator(fs::path(fDirectory.Path(kRecordedRoot)) / kNotes, none)) {
+    struct stat status {};
+    if (::stat(note.path().c_str(), &status) == 0 && HasLoss(status))
+      throw TFailure(kExitNotWritten,
+                     "the report would not be complete: " + Printable(note.path().filename().string()) + ": " + kNotAllWritten);
+  }
+}
 
 TRecorder::TResult TRecorder::Finish(std::vector<TPlugIn> const& plugIns, TThresholds const& thresholds) const {
   fs::path const root = fDirectory.Path(kRecordedRoot);

@@ -23,7 +23,11 @@ public:
     TRecordingIndex fIndex;
     std::string fArchive;
   };
-  TResult Finish(std::vector<TPlugIn> const& plugIns, TThresholds const& thresholds = {}) const;
+  TResult Finish(std::vector<TPlugIn> const& plugIns, TThresholds const& thresholds) const;
+
+  // Throws TFailure with kExitNotWritten if something that a plug-in read could not be written to the temporary directory: the
+  // plug-in read it from there, so it is missing in its answer, too.
+  void CheckNothingIsLost() const;
 
 private:
   TScratchDirectory fDirectory;

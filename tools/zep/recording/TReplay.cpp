@@ -30,6 +30,9 @@ TRecordingIndex UnpackOrThrow(std::string const& file, std::string const& direct
     return UnpackRecording(file, directory);
   } catch (TArchiveError const& failure) {
     throw TFailure(kExitNoInput, Printable(file) + " is refused: " + failure.what());
+  } catch (std::system_error const& failure) {
+    throw TFailure(kExitNotWritten, Printable(file) + " cannot be unpacked into the temporary directory " + Printable(directory) +
+                                        ": " + failure.what() + "; free space in it, or name another directory in TMPDIR");
   }
 }
 

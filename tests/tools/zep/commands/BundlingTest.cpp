@@ -3,6 +3,7 @@
 // zep report --bundle and zep verify. tests/tools/zep/bundle has every kind of tampering.
 
 #include "tests/collect/stored/StoredDocument.h"
+#include "tests/tools/zep/TFileLimit.h"
 #include "tests/tools/zep/Zep.h"
 #include "tests/tools/zep/bundle/Certificates.h"
 
@@ -78,6 +79,27 @@ TEST_F(BundlingTest, ReportAndRecordingAreOfOneReading) {
   for (char const* member : {"head", "identity", "details", "findings"}) EXPECT_EQ(reported[member], replayed[member]) << member;
   EXPECT_EQ(Run({"report", "--from", "report.json", "--html", "again.html"}).fErrors, "");
   EXPECT_EQ(ReadFile(Work("again.html")), ReadFile(Work("report.html")));
+}
+
+TEST_F(BundlingTest, TheRecordingHasTheThresholdsOfTheReport) {
+  WriteFile(Work("zep.cfg"), "finding-file-system-free-percent=42\n");
+  EXPECT_EQ(Run({"report", "--bundle", "b.tar.zst"}).fErrors, "");
+  fs::remove(Work("zep.cfg"));
+  Shell("tar --zstd -xf b.tar.zst");
+  auto const replayed = JsonOf(Run({"report", "--json", "--replay", "recording.tar.zst"}));
+  EXPECT_EQ(replayed["findings"]["thresholds"]["finding-file-system-free-percent"], 42);
+}
+
+// The plug-ins read what was recorded, so the report would be wrong.
+TEST_F(BundlingTest, AFullTemporaryDirectoryLeavesNoBundle) {
+  TFileLimit const limit(700);
+  TRun const run = Run({"report", "--bundle", "b.tar.zst"});
+  EXPECT_EQ(run.fStatus, 73);
+  EXPECT_EQ(run.fErrors,
+            "zep: the report would not be complete: libHost.nsp.so: what it reads could not be written to the temporary "
+            "directory; free space in it, or name another directory in TMPDIR\n");
+  EXPECT_FALSE(fs::exists(Work("b.tar.zst")));
+  EXPECT_TRUE(fs::is_empty(fTemporary.Path()));
 }
 
 TEST_F(BundlingTest, ABundleIsVerifiedWithTheOrdinaryTools) {

@@ -2,6 +2,8 @@
 
 // zep record and zep report --replay. tests/system/machines compares the reports.
 
+#include "tests/tools/zep/TFileLimit.h"
+#include "tests/tools/zep/Timing.h"
 #include "tests/tools/zep/Zep.h"
 
 #include <gmock/gmock.h>
@@ -34,6 +36,7 @@ TEST_F(RecordTest, ARecordingIsForItsOwnerAndReadableWithTar) {
   TRun const run = Run({"record", "here.rec"});
   EXPECT_EQ(run.fStatus, 0) << run.fErrors;
   EXPECT_THAT(run.fOutput, StartsWith("The recording here.rec has "));
+  EXPECT_THAT(run.fOutput, HasSubstr("passwords in them included"));
   EXPECT_EQ(fs::status(fZep.Path("here.rec")).permissions(), fs::perms::owner_read | fs::perms::owner_write);
   std::string const list = "tar --zstd -tf '" + fZep.Path("here.rec") + "' root/proc/meminfo > '" + fZep.Path("list") + "' 2>&1";
   EXPECT_EQ(std::system(list.c_str()), 0);
@@ -51,10 +54,40 @@ TEST_F(RecordTest, ARefusedRecordingIsNamedAndNothingOfItRemains) {
   EXPECT_EQ(TemporaryFiles(), 0u);
 }
 
+TEST_F(RecordTest, AFullTemporaryDirectoryIsNamedWithTheRemedy) {
+  ASSERT_EQ(Run({"record", "here.rec"}).fStatus, 0);
+  TFileLimit const limit(700);
+  TRun const run = Run({"report", "--replay", "here.rec"});
+  EXPECT_EQ(run.fStatus, 73);
+  EXPECT_THAT(run.fErrors, StartsWith("zep: here.rec cannot be unpacked into the temporary directory " + fTemporary.Path()));
+  EXPECT_THAT(run.fErrors, HasSubstr("File too large; free space in it, or name another directory in TMPDIR\n"));
+  EXPECT_EQ(TemporaryFiles(), 0u);
+}
+
 TEST_F(RecordTest, ARecordingIsOfOneMachine) {
   TRun const run = Run({"record", "here.rec"}, {{"ZEP_SMBIOS_TABLE", SamplePath()}, {"ZEP_HOST_NAME", "other-host"}});
   EXPECT_EQ(run.fStatus, 0) << run.fErrors;
   EXPECT_THAT(Run({"report", "--replay", "here.rec"}).fOutput, testing::Not(HasSubstr("other-host")));
+}
+
+// Root replays what a user recorded, and is refused what the user was refused.
+TEST_F(RecordTest, ARecordingByAUserGivesTheReportOfThatUser) {
+  NEEDS(::geteuid() == 0, "root, to become another user");
+  TTempDir const machine;
+  std::string const tables = machine.Path("sys/firmware/dmi/tables");
+  fs::create_directories(tables);
+  fs::copy(SamplePath(), tables + "/DMI");
+  fs::permissions(tables + "/DMI", fs::perms::owner_read);
+  for (std::string const& directory : {machine.Path(), fTemporary.Path()}) fs::permissions(directory, fs::perms::all);
+
+  std::string const recording = fTemporary.Path("user.rec");
+  auto const runAsNobody = [&](std::vector<std::string> const& arguments) {
+    return fZep.Run({arguments, {{"ZEP_ROOT", machine.Path()}, {"ZEP_SCSI_DEVICES", ""}, {"TMPDIR", fTemporary.Path()}}, true});
+  };
+  ASSERT_EQ(runAsNobody({"record", recording}).fStatus, 0);
+  std::string const report = WithoutTiming(runAsNobody({"report", "--json"}).fOutput);
+  EXPECT_THAT(report, HasSubstr("only root can read the SMBIOS tables"));
+  EXPECT_EQ(WithoutTiming(Run({"report", "--json", "--replay", recording}).fOutput), report);
 }
 
 // The thresholds and paths of the machine that replays do not matter.

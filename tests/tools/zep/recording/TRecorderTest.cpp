@@ -2,6 +2,7 @@
 #include "tools/zep/recording/TRecorder.h"
 
 #include "tests/Support.h"
+#include "tools/zep/output/Failure.h"
 
 #include <gmock/gmock.h>
 
@@ -34,7 +35,8 @@ TEST_F(TRecorderTest, EachPlugInIsRecordedOrHasTheReason) {
   Note("libPart.nsp.so", fs::perms::owner_read | fs::perms::owner_write);
   auto const index = recorder
                          .Finish({PlugIn("libWhole.nsp.so"), PlugIn("libPart.nsp.so"), PlugIn("libOther.nsp.so"),
-                                  PlugIn("libBad.nsp.so", "it crashed")})
+                                  PlugIn("libBad.nsp.so", "it crashed")},
+                                 {})
                          .fIndex;
   EXPECT_THAT(index.fPlugIns, ElementsAre("libWhole.nsp.so"));
   std::vector<std::string> notRecorded;
@@ -47,6 +49,23 @@ TEST_F(TRecorderTest, EachPlugInIsRecordedOrHasTheReason) {
                   "libBad.nsp.so: it crashed"));
 }
 
+TEST_F(TRecorderTest, ALossIsAFailureThatNamesThePlugInAndTheRemedy) {
+  TRecorder const recorder;
+  EXPECT_NO_THROW(recorder.CheckNothingIsLost());
+  Note("libWhole.nsp.so", fs::perms::owner_read);
+  EXPECT_NO_THROW(recorder.CheckNothingIsLost());
+  Note("libPart.nsp.so", fs::perms::owner_read | fs::perms::owner_write);
+  try {
+    recorder.CheckNothingIsLost();
+    FAIL() << "no loss was found";
+  } catch (TFailure const& failure) {
+    EXPECT_EQ(failure.fStatus, kExitNotWritten);
+    EXPECT_STREQ(failure.what(),
+                 "the report would not be complete: libPart.nsp.so: what it reads could not be written to the temporary "
+                 "directory; free space in it, or name another directory in TMPDIR");
+  }
+}
+
 TEST_F(TRecorderTest, AFileWhoseNameIsNotUtf8IsLeftOutAndNamed) {
   TRecorder const recorder;
   Note("libWhole.nsp.so", fs::perms::owner_read);
@@ -54,7 +73,7 @@ TEST_F(TRecorderTest, AFileWhoseNameIsNotUtf8IsLeftOutAndNamed) {
   WriteFile((root / "a\xff").string(), "");
   WriteFile((root / "b").string(), "");
   fs::create_symlink("x\xff", root / "c");
-  TRecordingIndex const index = recorder.Finish({PlugIn("libWhole.nsp.so")}).fIndex;
+  TRecordingIndex const index = recorder.Finish({PlugIn("libWhole.nsp.so")}, {}).fIndex;
   std::vector<std::string> names, left;
   for (TRecordedMember const& member : index.fMembers) names.push_back(member.fMember.fName);
   for (TNotRecorded const& row : index.fNotRecorded) left.push_back(row.fFile);
@@ -65,7 +84,7 @@ TEST_F(TRecorderTest, AFileWhoseNameIsNotUtf8IsLeftOutAndNamed) {
 
 // The bytes become escapes in the index.
 TEST_F(TRecorderTest, AReasonThatIsNotUtf8DoesNotPreventTheRecording) {
-  TRecordingIndex const index = TRecorder().Finish({PlugIn("libBad.nsp.so", "it \xff")}).fIndex;
+  TRecordingIndex const index = TRecorder().Finish({PlugIn("libBad.nsp.so", "it \xff")}, {}).fIndex;
   EXPECT_EQ(IndexFrom(TextOf(index)).fNotRecorded.at(0).fFile, "libBad.nsp.so");
   EXPECT_EQ(IndexFrom(TextOf(index)).fNotRecorded.at(0).fReason, "it \\xff");
 }
