@@ -71,8 +71,11 @@ TEST(TextsTest, LettersOfAnyLanguageContinueAWordAndOtherCharactersEndIt) {
 // The marks are those of the normal form.
 TEST(SpellingsTest, AValueHasASpellingInEachEncoding) {
   EXPECT_THAT(SpellingsOf("KQ12345"), IsSupersetOf({"KQ12345", "4b513132333435", "4b-51-31-32-33-34-35"}));
-  EXPECT_THAT(Base64Of("KQ12345"), ElementsAre("S1ExMjM0N", "tRMTIzND", "LUTEyMzQ1"));
-  EXPECT_THAT(Base64Of("KQ123"), IsEmpty());
+  EXPECT_THAT(Base64Of("KQ12345"),
+              IsSupersetOf({"S1ExMjM0N", "tRMTIzND", "LUTEyMzQ1", "SwBRADEAMgAzADQANQ", "AEsAUQAxADIAMwA0AD"}));
+  EXPECT_THAT(Base64Of("KQ123"), ElementsAre("SwBRADEAMgAzA", "sAUQAxADIAMw", "LAFEAMQAyADMA",  // of UTF-16 alone
+                                             "AEsAUQAxADIAM", "BLAFEAMQAyAD", "ASwBRADEAMgAz"));
+  EXPECT_THAT(Base64Of("KQ"), IsEmpty());
   EXPECT_THAT(SpellingsOf("525400112202"), IsSupersetOf({"52-54-00-11-22-02", "5254-0011-2202"}));
   EXPECT_THAT(SpellingsOf("192.0.2.1"), IsSupersetOf({"c0000201", "010200c0"}));
   EXPECT_THAT(SpellingsOf("2001:db8::1"),

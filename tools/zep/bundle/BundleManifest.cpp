@@ -7,7 +7,6 @@
 #include "tools/zep/packing/Archive.h"
 #include "tools/zep/recording/RecordingIndex.h"
 
-#include <ctime>
 #include <set>
 
 namespace NQRVZEP20::zep {
@@ -33,13 +32,6 @@ constexpr TLimit kLimits[] = {
 
 bool IsSha256(std::string const& text) { return text.size() == 64 && text.find_first_not_of("0123456789abcdef") == text.npos; }
 
-// "2026-11-23T04:05:06Z"
-bool IsTime(std::string const& text) {
-  std::tm utc{};
-  char const* const end = ::strptime(text.c_str(), "%Y-%m-%dT%H:%M:%SZ", &utc);
-  return end != nullptr && TimeText(::timegm(&utc)) == text;
-}
-
 TBundledPiece PieceFrom(TJson const& json) {
   TBundledPiece piece{json.at("name").get<std::string>(), json.at("bytes").get<std::uint64_t>(),
                       json.at("sha256").get<std::string>(), json.at("obtained").get<std::string>()};
@@ -63,7 +55,7 @@ TBundleManifest Read(TJson const& json) {
   CheckVersion(json);
   TBundleManifest manifest;
   manifest.fTime = json.at("time").get<std::string>();
-  if (!IsTime(manifest.fTime)) ThrowUnsound("its time is invalid");
+  if (!IsTimeText(manifest.fTime)) ThrowUnsound("its time is invalid");
   manifest.fTool = json.at("zepVersion").get<std::string>();
   manifest.fIsSigned = json.at("signed").get<bool>();
   manifest.fRedacted = json.at("redacted").get<std::vector<std::string>>();

@@ -47,9 +47,7 @@ bool IsWithinRoot(std::string const& path) {
 
 std::string TimeIn(TJson const& json) {
   std::string const text = json.at("time").get<std::string>();
-  std::tm utc{};
-  char const* const end = ::strptime(text.c_str(), "%Y-%m-%dT%H:%M:%SZ", &utc);
-  if (end == nullptr || TimeText(::timegm(&utc)) != text) ThrowUnsound("the time " + Printable(text) + " is invalid");
+  if (!IsTimeText(text)) ThrowUnsound("the time " + Printable(text) + " is invalid");
   return text;
 }
 
@@ -165,6 +163,12 @@ std::string TimeText(std::time_t time) {
   char text[sizeof "2026-11-23T04:05:06Z"];
   std::strftime(text, sizeof text, "%Y-%m-%dT%H:%M:%SZ", &utc);
   return text;
+}
+
+bool IsTimeText(std::string const& text) {
+  std::tm utc{};
+  char const* const end = ::strptime(text.c_str(), "%Y-%m-%dT%H:%M:%SZ", &utc);
+  return end != nullptr && TimeText(::timegm(&utc)) == text;
 }
 
 }  // namespace NQRVZEP20::zep

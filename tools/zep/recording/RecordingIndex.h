@@ -53,5 +53,6 @@ TRecordingIndex IndexFrom(std::string const& text);
 
 // "2026-11-23T04:05:06Z"
 std::string TimeText(std::time_t time);
+bool IsTimeText(std::string const& text);  // a valid time in that form
 
 }  // namespace NQRVZEP20::zep
