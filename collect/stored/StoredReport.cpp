@@ -2,6 +2,7 @@
 #include "collect/stored/StoredReport.h"
 
 #include "collect/UnitText.h"
+#include "collect/redaction/ESecretKind.h"
 #include "collect/stored/StoredDocument.h"
 #include "collect/stored/TStoredNode.h"
 
@@ -49,11 +50,22 @@ TReportSection SectionOf(TStoredNode const& node) {
   return section;
 }
 
+constexpr char const* kUnknownWord = "is a word that no report has";
+
 // The text of the member, which must be one of the words.
 std::string WordOf(TStoredNode const& node, char const* name, std::initializer_list<std::string_view> words) {
   std::string const text = node.TextOf(name);
-  if (std::find(words.begin(), words.end(), text) == words.end()) node.Member(name).Refuse("is a word that no report has");
+  if (std::find(words.begin(), words.end(), text) == words.end()) node.Member(name).Refuse(kUnknownWord);
   return text;
+}
+
+std::string RedactionOf(TStoredNode const& node) {
+  std::string const map = node.TextOf("map");
+  TStoredNode const kinds = node.Member("kinds");
+  kinds.ForEachElement([](TStoredNode const& kind) {
+    if (!SecretKindFrom(kind.Text())) kind.Refuse(kUnknownWord);
+  });
+  return map + " " + kinds.AsJson();
 }
 
 TStoredProblem ProblemOf(TStoredNode const& node) {
@@ -155,8 +167,7 @@ TStoredReport ReportOf(TStoredNode const& document) {
   if (auto const time = document.Optional("time")) report.fTime = time->Text();
   report.fStatus = WordOf(document, "status", {"complete", "partial", "nothing"});
   report.fReason = document.TextOrNullOf("reason");
-  if (auto const redaction = document.Optional("redaction"))
-    report.fRedaction = redaction->Member("map").AsJson() + " " + redaction->Member("kinds").AsJson();
+  if (auto const redaction = document.Optional("redaction")) report.fRedaction = RedactionOf(*redaction);
   report.fHead = document.Member("head").Elements([](TStoredNode const& line) { return line.Text(); });
   TStoredNode const findings = document.Member("findings");
   report.fProblems = findings.Member("problems").Elements(ProblemOf);

@@ -77,7 +77,7 @@ struct TStoredReport {
   std::string fTime;       // "2026-11-23T04:05:06Z"; empty if the document does not have it
   std::string fStatus;     // "complete", "partial" or "nothing"
   std::string fReason;     // why it is not complete; otherwise empty
-  std::string fRedaction;  // the map and the kinds of the member "redaction" as JSON: the same pseudonym stands for the same
+  std::string fRedaction;  // the map and the kinds of the member "redaction": the same pseudonym stands for the same
                            // secret in reports where they are the same; empty if the report is not redacted
   std::vector<std::string> fHead;
   std::vector<TStoredProblem> fProblems;

@@ -106,7 +106,7 @@ TEST(StoredReportTest, AReportHasTheMapAndTheKindsOfItsRedaction) {
   std::string const redaction =
       "\"redaction\": {\"map\": \"0a\", \"kinds\": [\"hosts\"], \"spellings\": [{\"place\": \"/x\", \"letters\": [\"b\"]}]}, ";
   TStoredReport const report = StoredReportFrom(StoredDocumentWith("\"status\"", redaction + "\"status\""), "a.json");
-  EXPECT_EQ(report.fRedaction, "\"0a\" [\"hosts\"]");
+  EXPECT_EQ(report.fRedaction, "0a [\"hosts\"]");
   EXPECT_EQ(StoredReportFrom(StoredDocument(), "a.json").fRedaction, "");
 }
 
@@ -138,6 +138,10 @@ TEST(StoredReportTest, AnAlteredDocumentIsRefusedWithThePlace) {
       {"\"value\": \"17179869184\"", "\"value\": {}", "a.json: /instances/0/properties/Capacity/value: is not a value"},
       {"\"value\": [2, 9]", "\"value\": [2, []]", "a.json: /instances/0/properties/States/value/1: is not a value"},
       {"\"class\": \"CIM_Realizes\"", "\"class\": 7", "a.json: /instances/2/class: is not a string"},
+      {"\"status\"", "\"redaction\": 5, \"status\"", "a.json: /redaction: is not an object"},
+      {"\"status\"", "\"redaction\": {\"map\": 1, \"kinds\": []}, \"status\"", "a.json: /redaction/map: is not a string"},
+      {"\"status\"", "\"redaction\": {\"map\": \"a\", \"kinds\": [\"hosts\", \"foo\"]}, \"status\"",
+       "a.json: /redaction/kinds/1: is a word that no report has"},
       {"\"milliseconds\": 2", "\"milliseconds\": \"2\"", "a.json: /plugIns/1/milliseconds: is not a number"},
   };
   for (auto const& row : rows) EXPECT_EQ(WhyTextRefused(StoredDocumentWith(row.fFrom, row.fTo)), row.fReason) << row.fTo;
