@@ -3,12 +3,13 @@
 
 #include "collect/stored/ObjectName.h"
 #include "collect/stored/TExamined.h"
+#include "collect/stored/UsualChanges.h"
 
 #include <algorithm>
-#include <cmath>
-#include <cstdlib>
 #include <iterator>
-#include <string_view>
+#include <map>
+#include <set>
+#include <utility>
 
 namespace NQRVZEP20 {
 
@@ -16,80 +17,43 @@ namespace {
 
 using EKind = TObjectDifference::EKind;
 
-// ---- What always changes ----
+// ---- What could not be compared ----
 
-bool Contains(std::string_view text, std::string_view part) { return text.find(part) != text.npos; }
+void AddOnce(std::string const& reason, std::vector<std::string>& reasons) {
+  if (std::find(reasons.begin(), reasons.end(), reason) == reasons.end()) reasons.push_back(reason);
+}
 
-// Properties that change on a machine with which nothing has happened; those in the first column of any class.
-struct TVolatile {
-  std::string_view fClass, fProperty;
+// The values that one report could not read, by its file and the reason.
+class TUnreadValues {
+public:
+  void Add(std::string const& file, std::string const& reason, std::string const& value) {
+    fValues[{file, reason}].insert(value);
+  }
+
+  void AddTo(std::vector<std::string>& notCompared) const {
+    for (auto const& [row, values] : fValues) {
+      std::string names;
+      for (std::string const& value : values) names += (names.empty() ? "" : ", ") + value;
+      AddOnce(row.first + " has no " + names + ": " + row.second, notCompared);
+    }
+  }
+
+private:
+  std::map<std::pair<std::string, std::string>, std::set<std::string>> fValues;
 };
-constexpr TVolatile kVolatile[] = {{"", "AvailableMemory"},
-                                   {"", "AvailableSpace"},
-                                   {"", "ClockTime"},
-                                   {"", "CurrentClockSpeed"},
-                                   {"", "FreeInodes"},
-                                   {"", "FreeMemory"},
-                                   {"", "FreePhysicalMemory"},
-                                   {"", "FreeSpace"},
-                                   {"", "FreeSpaceInPagingFiles"},
-                                   {"", "FreeSwap"},
-                                   {"", "FreeVirtualMemory"},
-                                   {"", "LoadOfFifteenMinutes"},
-                                   {"", "LoadOfFiveMinutes"},
-                                   {"", "LoadOfOneMinute"},
-                                   {"", "LoadPercentage"},
-                                   {"", "LocalDateTime"},
-                                   {"", "NumberOfFiles"},
-                                   {"", "NumberOfProcesses"},
-                                   {"", "NumberOfUsers"},
-                                   {"", "PowerOnHours"},
-                                   {"", "PreferredLifetime"},
-                                   {"", "TotalPowerOnHours"},
-                                   {"", "Uptime"},
-                                   {"", "ValidLifetime"},
-                                   {"ZEP_DiskHealth", "BytesRead"},
-                                   {"ZEP_DiskHealth", "BytesWritten"},
-                                   {"ZEP_KernelLog", "CurrentNumberOfRecords"},
-                                   {"ZEP_KernelLog", "GoneRecords"},
-                                   {"ZEP_RaidArray", "Progress"},
-                                   {"ZEP_SmartAttribute", "RawText"},
-                                   {"ZEP_SmartAttribute", "RawValue"},
-                                   {"ZEP_SwapArea", "Used"}};
-
-bool IsVolatile(std::string const& cls, std::string const& property) {
-  bool const isTraffic = Contains(cls, "Statistics") && !Contains(property, "Error") && !Contains(property, "Failure");
-  return isTraffic || std::any_of(std::begin(kVolatile), std::end(kVolatile), [&](TVolatile const& row) {
-           return row.fProperty == property && (row.fClass.empty() || row.fClass == cls);
-         });
-}
-
-bool IsReading(std::string const& cls, std::string const& property) {
-  return property == "CurrentReading" || (cls == "ZEP_DiskHealth" && property == "Temperature") ||
-         (cls == "ZEP_SmartAttribute" && property == "Value");
-}
-
-double NumberIn(TStoredProperty const* property) {
-  return property != nullptr && property->IsKnown() ? std::strtod(property->fRaw.c_str(), nullptr) : 0;
-}
-
-// Whether the reading of a sensor moved less than makes it another one, in either direction.
-bool IsWithinHysteresis(TStoredInstance const& before, TStoredInstance const& after, std::string const& name) {
-  constexpr double usual = 0.1;  // of the reading
-  TStoredProperty const *const one = before.Find(name), *const other = after.Find(name);
-  if (!IsReading(before.fClass, name) || !one->IsKnown() || !other->IsKnown()) return false;
-  double const hysteresis = std::max(NumberIn(before.Find("Hysteresis")), NumberIn(after.Find("Hysteresis")));
-  double const largest = std::max(std::abs(NumberIn(one)), std::abs(NumberIn(other)));
-  return std::abs(NumberIn(one) - NumberIn(other)) <= (hysteresis > 0 ? hysteresis : usual * largest);
-}
 
 // ---- Values ----
+
+// A known text; quotes show where an empty one is.
+std::string Shown(std::string const& text) { return text.empty() ? "\"\"" : text; }
+
+std::string Unknown(TMissing const& missing) { return "unknown (" + missing.fReason + ")"; }
 
 // For people: the rounded texts of different values may be equal; then the values themselves.
 TChange ChangeOf(TStoredProperty const& before, TStoredProperty const& after) {
   auto const text = [&](TStoredProperty const& property) {
-    if (!property.IsKnown()) return "unknown (" + property.fMissing.fReason + ")";
-    return before.fText == after.fText ? property.fRaw : property.fText;
+    if (!property.IsKnown()) return Unknown(property.fMissing);
+    return Shown(before.fText == after.fText ? property.fRaw : property.fText);
   };
   return {before.fName, text(before), text(after)};
 }
@@ -98,13 +62,29 @@ bool IsSame(TStoredProperty const& before, TStoredProperty const& after) {
   return before.IsKnown() == after.IsKnown() && before.fRaw == after.fRaw;
 }
 
+// Two reports, and what their comparison finds.
+struct TComparison {
+  TExamined const &fBefore, &fAfter;
+  TUnreadValues fUnread;
+  TDifferences fDifferences;
+
+  // Whether one of the reports could not read the value, which is noted then. The other one has it.
+  bool IsUnread(TMissing const& before, TMissing const& after, std::string const& value) {
+    bool const isBefore = NQRVZEP20::IsUnread(before.fCode);
+    if (!isBefore && !NQRVZEP20::IsUnread(after.fCode)) return false;
+    fUnread.Add((isBefore ? fBefore : fAfter).File(), (isBefore ? before : after).fReason, value);
+    return true;
+  }
+};
+
 // A property that only one of the programs knew is not a change of the machine.
-std::vector<TChange> ChangesOf(TStoredInstance const& before, TStoredInstance const& after) {
+std::vector<TChange> ChangesOf(TStoredInstance const& before, TStoredInstance const& after, TComparison& comparison) {
   std::vector<TChange> changes;
   for (TStoredProperty const& property : before.fProperties) {
     TStoredProperty const* const other = after.Find(property.fName);
-    if (other == nullptr || IsSame(property, *other) || IsVolatile(before.fClass, property.fName)) continue;
-    if (!IsWithinHysteresis(before, after, property.fName)) changes.push_back(ChangeOf(property, *other));
+    if (other == nullptr || IsSame(property, *other) || IsUsualChange(before, after, property.fName)) continue;
+    if (!comparison.IsUnread(property.fMissing, other->fMissing, before.fClass + "." + property.fName))
+      changes.push_back(ChangeOf(property, *other));
   }
   return changes;
 }
@@ -112,10 +92,6 @@ std::vector<TChange> ChangesOf(TStoredInstance const& before, TStoredInstance co
 // ---- Objects ----
 
 bool IsCompared(TStoredInstance const& instance) { return !instance.IsAssociation(); }
-
-void AddOnce(std::string const& reason, std::vector<std::string>& reasons) {
-  if (std::find(reasons.begin(), reasons.end(), reason) == reasons.end()) reasons.push_back(reason);
-}
 
 TObjectDifference DifferenceOf(EKind kind, TStoredInstance const& instance, std::vector<TChange> changes = {}) {
   return {kind, instance.fClass, instance.fPath, ObjectName(instance), std::move(changes)};
@@ -133,72 +109,100 @@ void AddMissing(EKind kind, TExamined const& some, TExamined const& others, TDif
   }
 }
 
-void AddChanged(TExamined const& before, TExamined const& after, TDifferences& differences) {
-  for (auto const& [key, instance] : before.Instances()) {
-    auto const other = after.Instances().find(key);
-    if (other == after.Instances().end() || !IsCompared(*instance)) continue;
-    if (auto changes = ChangesOf(*instance, *other->second); !changes.empty())
-      differences.fObjects.push_back(DifferenceOf(EKind::kChanged, *other->second, std::move(changes)));
+void AddChanged(TComparison& comparison) {
+  for (auto const& [key, instance] : comparison.fBefore.Instances()) {
+    auto const other = comparison.fAfter.Instances().find(key);
+    if (other == comparison.fAfter.Instances().end() || !IsCompared(*instance)) continue;
+    if (auto changes = ChangesOf(*instance, *other->second, comparison); !changes.empty())
+      comparison.fDifferences.fObjects.push_back(DifferenceOf(EKind::kChanged, *other->second, std::move(changes)));
   }
 }
 
-// ---- Rows and problems ----
+// ---- Rows ----
 
 // A reason may contain a figure that changes, so two missing values are the same.
 bool IsSame(TAnswer<std::string> const& before, TAnswer<std::string> const& after) {
   return before.IsKnown() == after.IsKnown() && (!before.IsKnown() || *before.fValue == *after.fValue);
 }
 
-void AddRows(std::vector<TStoredRow> const& before, std::vector<TStoredRow> const& after, std::vector<TChange>& changes) {
+// Values of two sources differ although nothing has changed: the kernel uses less memory than the modules have.
+bool AreOfOneSource(TAnswer<std::string> const& before, TAnswer<std::string> const& after) {
+  return !before.IsKnown() || !after.IsKnown() || before.fSource == after.fSource;
+}
+
+void AddRow(TStoredRow const& before, TStoredRow const& after, TComparison& comparison) {
   auto const text = [](TStoredRow const& row) {
-    return row.fAnswer.IsKnown() ? *row.fAnswer.fValue : "unknown (" + row.fAnswer.fMissing.fReason + ")";
+    return row.fAnswer.IsKnown() ? Shown(*row.fAnswer.fValue) : Unknown(row.fAnswer.fMissing);
   };
+  if (IsSame(before.fAnswer, after.fAnswer)) return;
+  if (comparison.IsUnread(before.fAnswer.fMissing, after.fAnswer.fMissing, before.fLabel)) return;
+  TDifferences& differences = comparison.fDifferences;
+  if (AreOfOneSource(before.fAnswer, after.fAnswer))
+    differences.fRows.push_back({before.fLabel, text(before), text(after)});
+  else
+    AddOnce(before.fLabel + " is from " + before.fAnswer.fSource + " in " + comparison.fBefore.File() + ", and from " +
+                after.fAnswer.fSource + " in " + comparison.fAfter.File(),
+            differences.fNotCompared);
+}
+
+void AddRows(std::vector<TStoredRow> const& before, std::vector<TStoredRow> const& after, TComparison& comparison) {
   for (TStoredRow const& row : before)
     for (TStoredRow const& other : after)
-      if (row.fKey == other.fKey && !IsSame(row.fAnswer, other.fAnswer)) changes.push_back({row.fLabel, text(row), text(other)});
+      if (row.fKey == other.fKey) AddRow(row, other, comparison);
 }
 
-// The reason may contain a figure that changes, so it does not count.
-bool AreOfOneCause(TStoredProblem const& one, TStoredProblem const& other) {
-  return one.fRule == other.fRule && one.fInstance == other.fInstance;
+// ---- Problems ----
+
+// The reason of a problem may contain a figure that changes, so it does not count.
+struct TCause {
+  std::string fRule, fObject;
+  TStoredProblem fProblem;
+
+  bool operator==(TCause const& other) const { return fRule == other.fRule && fObject == other.fObject; }
+};
+using TCauses = std::vector<TCause>;
+
+TCauses CausesOf(std::vector<TStoredProblem> const& problems, TExamined const& examined) {
+  TCauses causes;
+  for (TStoredProblem const& problem : problems)
+    causes.push_back({problem.fRule, examined.LastingPathOf(problem.fInstance), problem});
+  return causes;
 }
 
-bool IsSame(TStoredProblem const& one, TStoredProblem const& other) {
-  return AreOfOneCause(one, other) && one.fSeverity == other.fSeverity;
-}
-
-// The problems of `some` that are not among `others`.
-std::vector<TStoredProblem> Without(std::vector<TStoredProblem> const& others, std::vector<TStoredProblem> const& some) {
-  std::vector<TStoredProblem> rest;
-  std::copy_if(some.begin(), some.end(), std::back_inserter(rest), [&](TStoredProblem const& problem) {
-    return std::none_of(others.begin(), others.end(), [&](TStoredProblem const& other) { return IsSame(problem, other); });
+// Those of `some` that are not among `others` with the same severity.
+TCauses Without(TCauses const& others, TCauses const& some) {
+  TCauses rest;
+  std::copy_if(some.begin(), some.end(), std::back_inserter(rest), [&](TCause const& cause) {
+    return std::none_of(others.begin(), others.end(), [&](TCause const& other) {
+      return cause == other && cause.fProblem.fSeverity == other.fProblem.fSeverity;
+    });
   });
   return rest;
 }
 
 // Removes those that have only another severity from both, and returns them.
-std::vector<TChangedProblem> TakeChanged(std::vector<TStoredProblem>& before, std::vector<TStoredProblem>& after) {
+std::vector<TChangedProblem> TakeChanged(TCauses& before, TCauses& after) {
   std::vector<TChangedProblem> changed;
-  auto const isTaken = [&](TStoredProblem const& problem) {
-    auto const other =
-        std::find_if(before.begin(), before.end(), [&](TStoredProblem const& its) { return AreOfOneCause(its, problem); });
-    if (other == before.end()) return false;
-    changed.push_back({other->fSeverity, problem});
+  TCauses rest;
+  for (TCause& cause : after) {
+    auto const other = std::find(before.begin(), before.end(), cause);
+    if (other == before.end()) {
+      rest.push_back(std::move(cause));
+      continue;
+    }
+    changed.push_back({other->fProblem.fSeverity, cause.fProblem});
     before.erase(other);
-    return true;
-  };
-  std::vector<TStoredProblem> rest;
-  for (TStoredProblem& problem : after)
-    if (!isTaken(problem)) rest.push_back(std::move(problem));
+  }
   after = std::move(rest);
   return changed;
 }
 
 // The problems that were found in `its` and could have been found in `other`. Adds why the rest could not.
-std::vector<TStoredProblem> Comparable(std::vector<TStoredProblem> const& problems, TExamined const& its, TExamined const& other,
+std::vector<TStoredProblem> Comparable(TCauses const& causes, TExamined const& its, TExamined const& other,
                                        std::vector<std::string>& notCompared) {
   std::vector<TStoredProblem> comparable;
-  for (TStoredProblem const& problem : problems) {
+  for (TCause const& cause : causes) {
+    TStoredProblem const& problem = cause.fProblem;
     std::string const why = other.WhyUnknown(problem, its.Find(problem.fInstance));
     if (why.empty())
       comparable.push_back(problem);
@@ -206,6 +210,16 @@ std::vector<TStoredProblem> Comparable(std::vector<TStoredProblem> const& proble
       AddOnce("problem \"" + problem.fReason + "\": " + why, notCompared);
   }
   return comparable;
+}
+
+void AddProblems(TStoredReport const& before, TStoredReport const& after, TComparison& comparison) {
+  TExamined const &earlier = comparison.fBefore, &later = comparison.fAfter;
+  TDifferences& differences = comparison.fDifferences;
+  TCauses const causesBefore = CausesOf(before.fProblems, earlier), causesAfter = CausesOf(after.fProblems, later);
+  TCauses solved = Without(causesAfter, causesBefore), appeared = Without(causesBefore, causesAfter);
+  differences.fChangedProblems = TakeChanged(solved, appeared);
+  differences.fNewProblems = Comparable(appeared, later, earlier, differences.fNotCompared);
+  differences.fSolvedProblems = Comparable(solved, earlier, later, differences.fNotCompared);
 }
 
 }  // namespace
@@ -219,21 +233,19 @@ std::string NameOf(TObjectDifference::EKind kind) {
 }
 
 TDifferences DifferencesOf(TStoredReport const& before, TStoredReport const& after) {
-  TDifferences differences;
-  auto& notCompared = differences.fNotCompared;
   TExamined const earlier(before), later(after);
+  TComparison comparison{earlier, later, {}, {}};
+  TDifferences& differences = comparison.fDifferences;
   for (TExamined const* const examined : {&earlier, &later})
-    for (auto const& [provider, failure] : examined->Failures()) AddOnce(failure, notCompared);
+    for (auto const& [provider, failure] : examined->Failures()) AddOnce(failure, differences.fNotCompared);
   AddMissing(EKind::kGone, earlier, later, differences);
   AddMissing(EKind::kAppeared, later, earlier, differences);
-  AddChanged(earlier, later, differences);
-  AddRows(before.fIdentity, after.fIdentity, differences.fRows);
-  AddRows(before.fDetails, after.fDetails, differences.fRows);
-  auto solved = Without(after.fProblems, before.fProblems), appeared = Without(before.fProblems, after.fProblems);
-  differences.fChangedProblems = TakeChanged(solved, appeared);
-  differences.fNewProblems = Comparable(appeared, later, earlier, notCompared);
-  differences.fSolvedProblems = Comparable(solved, earlier, later, notCompared);
-  return differences;
+  AddChanged(comparison);
+  AddRows(before.fIdentity, after.fIdentity, comparison);
+  AddRows(before.fDetails, after.fDetails, comparison);
+  comparison.fUnread.AddTo(differences.fNotCompared);
+  AddProblems(before, after, comparison);
+  return std::move(differences);
 }
 
 }  // namespace NQRVZEP20

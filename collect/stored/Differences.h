@@ -43,11 +43,11 @@ struct TDifferences {
 // For programs: "gone", "appeared" and "changed".
 std::string NameOf(TObjectDifference::EKind kind);
 
-// Compares two reports, object by object; objects are the same if they have the same path, and so the same class and keys.
-// Ignored are relations between objects, records of missing values, and what always changes: times, free space, load and traffic
-// (counters of errors are compared), and readings of sensors within their hysteresis, or within a tenth if they state none. An
-// object or a problem that only one report has is not compared if the other could not examine it (TExamined.h): nothing is gone,
-// new or solved that one of them merely did not see.
+// Compares two reports, object by object; objects are the same if they have the same lasting path, and so the same class and
+// keys. Ignored are relations between objects, records of missing values, and what always changes (UsualChanges.h). An object, a
+// value or a problem that only one report has is not compared if the other could not examine it (TExamined.h): nothing is gone,
+// new, changed or solved that one of them merely did not see. Values of identity and details are not compared if they have other
+// sources.
 TDifferences DifferencesOf(TStoredReport const& before, TStoredReport const& after);
 
 }  // namespace NQRVZEP20

@@ -3,6 +3,7 @@
 
 #include "Missing.h"
 #include "MissingValueClass.h"
+#include "collect/stored/UsualChanges.h"
 
 #include <algorithm>
 #include <set>
@@ -16,36 +17,56 @@ std::string TextOf(TStoredInstance const& instance, char const* property) {
   return found == nullptr ? "" : found->fText;
 }
 
-// Whether the source of the objects was missing or could not be read. Otherwise the machine has none of them.
-bool IsUnread(std::string const& code) {
-  return code != kMissingNotGiven && code != kMissingNotApplicable && code != kMissingPlaceholder;
-}
-
 }  // namespace
+
+bool IsUnread(std::string const& code) {
+  return !code.empty() && code != kMissingNotGiven && code != kMissingNotApplicable && code != kMissingPlaceholder;
+}
 
 TExamined::TExamined(TStoredReport const& report) : fReport(report) {
   for (TStoredProvider const& provider : report.fProviders) {
     std::string const& name = provider.fName.empty() ? provider.fPlugIn : provider.fName;
     if (!provider.fError.empty()) fFailures[name] = "provider " + name + " failed in " + report.fFile + ": " + provider.fError;
   }
+  AddInstances();
+  AddReasons();
+}
+
+void TExamined::AddInstances() {
   std::map<std::string, int> counts;
-  std::map<std::string, std::set<std::pair<std::string, std::string>>> unread;  // by reason
-  for (TStoredInstance const& instance : report.fInstances) {
-    if (instance.fClass != kMissingValueClass) {
-      fInstances.emplace(TKey(instance.fPath, counts[instance.fPath]++), &instance);
-    } else if (TextOf(instance, "ElementProperty").empty() && IsUnread(TextOf(instance, "Code"))) {
-      unread[TextOf(instance, "Reason")].emplace(instance.fNamespace, TextOf(instance, "ElementPath"));
-    }
-  }
-  for (auto const& [reason, classes] : unread) {
-    std::string names;
-    for (auto const& [ns, cls] : classes) names += (names.empty() ? "" : ", ") + cls;
-    for (auto const& row : classes) fWhyNoObjects[row] = report.fFile + " has no " + names + ": " + reason;
+  for (TStoredInstance const& instance : fReport.fInstances) {
+    if (instance.fClass == kMissingValueClass) continue;
+    std::string const path = LastingPath(instance);
+    if (path != instance.fPath) fLastingPaths.emplace(instance.fPath, path);
+    fInstances.emplace(TKey(path, counts[path]++), &instance);
   }
 }
 
+// A class that has objects is described, even if the provider gives a reason for some that are missing.
+void TExamined::AddReasons() {
+  std::set<TClass> described;
+  for (auto const& [key, instance] : fInstances) described.emplace(instance->fNamespace, instance->fClass);
+  std::map<std::string, std::set<TClass>> unread;  // by reason
+  for (TStoredInstance const& instance : fReport.fInstances) {
+    bool const isOfClass = instance.fClass == kMissingValueClass && TextOf(instance, "ElementProperty").empty();
+    TClass const cls(instance.fNamespace, isOfClass ? TextOf(instance, "ElementPath") : "");
+    if (isOfClass && IsUnread(TextOf(instance, "Code")) && described.count(cls) == 0)
+      unread[TextOf(instance, "Reason")].insert(cls);
+  }
+  for (auto const& [reason, classes] : unread) {
+    std::string names;
+    for (TClass const& cls : classes) names += (names.empty() ? "" : ", ") + cls.second;
+    for (TClass const& cls : classes) fWhyNoObjects[cls] = fReport.fFile + " has no " + names + ": " + reason;
+  }
+}
+
+std::string TExamined::LastingPathOf(std::string const& path) const {
+  auto const lasting = fLastingPaths.find(path);
+  return lasting == fLastingPaths.end() ? path : lasting->second;
+}
+
 TStoredInstance const* TExamined::Find(std::string const& path) const {
-  auto const found = fInstances.find({path, 0});
+  auto const found = fInstances.find({LastingPathOf(path), 0});
   return found == fInstances.end() ? nullptr : found->second;
 }
 

@@ -9,6 +9,10 @@
 
 namespace NQRVZEP20 {
 
+// Whether the code of a missing value says that its source was missing or could not be read. The machine may have the value then;
+// with the other codes it has none.
+bool IsUnread(std::string const& code);
+
 // What a report could examine. The machine may have an object or a problem that its report lacks: where a provider failed, where
 // a source could not be read, and where a rule could not be asked.
 //
@@ -17,10 +21,13 @@ class TExamined {
 public:
   explicit TExamined(TStoredReport const& report);
 
-  // The objects of the report, by path and, of several with one path, their number.
+  std::string const& File() const { return fReport.fFile; }
+
+  // The objects of the report, by lasting path (UsualChanges.h) and, of several with one path, their number.
   using TKey = std::pair<std::string, int>;
   std::map<TKey, TStoredInstance const*> const& Instances() const { return fInstances; }
-  TStoredInstance const* Find(std::string const& path) const;  // the first; null if there is none
+  TStoredInstance const* Find(std::string const& path) const;  // by its own path; the first; null if there is none
+  std::string LastingPathOf(std::string const& path) const;    // of the object that has the path, or the path itself
 
   // Why the machine may have an object like this one, which the report lacks; empty if the report would contain it.
   std::string WhyUnknown(TStoredInstance const& instance) const;
@@ -32,10 +39,16 @@ public:
   std::map<std::string, std::string> const& Failures() const { return fFailures; }
 
 private:
+  using TClass = std::pair<std::string, std::string>;  // with its namespace, which is first
+
   TStoredReport const& fReport;
   std::map<TKey, TStoredInstance const*> fInstances;
-  std::map<std::string, std::string> fFailures;                              // by the name of the provider
-  std::map<std::pair<std::string, std::string>, std::string> fWhyNoObjects;  // by namespace and class
+  std::map<std::string, std::string> fLastingPaths;  // by path, where they differ
+  std::map<std::string, std::string> fFailures;      // by the name of the provider
+  std::map<TClass, std::string> fWhyNoObjects;
+
+  void AddInstances();
+  void AddReasons();
 };
 
 }  // namespace NQRVZEP20

@@ -13,17 +13,6 @@ TStoredReport With(std::string const& from, std::string const& to) {
   return StoredReportFrom(HealthyDocumentWith(from, to), "b.json");
 }
 
-// A report whose first instance is a sensor of that class with one reading.
-TStoredReport WithProperty(std::string const& cls, std::string const& name, std::string const& value,
-                           std::string const& more = "") {
-  TStoredReport report = Before();
-  TStoredInstance& instance = report.fInstances.front();
-  instance.fClass = cls;
-  instance.fProperties.push_back({name, "uint32", false, value, value, "", "", {}});
-  if (!more.empty()) instance.fProperties.push_back({"Hysteresis", "uint32", false, more, more, "", "", {}});
-  return report;
-}
-
 TEST(DifferencesTest, EqualReportsAreTheSame) {
   TDifferences const differences = DifferencesOf(Before(), Before());
   EXPECT_TRUE(differences.IsSame());
@@ -48,7 +37,9 @@ TEST(DifferencesTest, AChangeHasWordsAndUnits) {
       {"17179869184", "34359738368", "Capacity", "16 GiB", "32 GiB"},
       {"17179869184", "17179869185", "Capacity", "17179869184", "17179869185"},
       {"26, \"words\": \"DDR4\"", "34, \"words\": \"DDR5\"", "MemoryType", "DDR4", "DDR5"},
-      {"\"value\": 1.25,", "\"value\": null, \"code\": \"x\", \"reason\": \"none\",", "Voltage", "1.25", "unknown (none)"},
+      {"\"value\": 1.25,", "\"value\": null, \"code\": \"not-given\", \"reason\": \"none\",", "Voltage", "1.25",
+       "unknown (none)"},
+      {"\"DIMM 1\", \"source\"", "\"\", \"source\"", "ElementName", "DIMM 1", "\"\""},
   };
   for (auto const& row : rows) {
     TDifferences const differences = DifferencesOf(Before(), With(row.fFrom, row.fTo));
@@ -102,42 +93,11 @@ TEST(DifferencesTest, EachProblemIsPairedOnce) {
   EXPECT_EQ(differences.fNewProblems.size(), 1u);
 }
 
-TEST(DifferencesTest, WithinWhatAlwaysChangesReportsAreTheSame) {
-  struct {
-    char const *fClass, *fProperty, *fBefore, *fAfter, *fHysteresis;
-    bool fIsSame;
-  } const rows[] = {
-      {"ZEP_RunningState", "Uptime", "1", "2", "", true},
-      {"ZEP_RunningState", "LoadOfOneMinute", "1", "2", "", true},
-      {"CIM_OperatingSystem", "FreePhysicalMemory", "1", "2", "", true},
-      {"ZEP_InterfaceStatistics", "BytesReceived", "1", "2", "", true},
-      {"ZEP_InterfaceStatistics", "ReceiveErrors", "1", "2", "", false},
-      {"CIM_NumericSensor", "CurrentReading", "40", "44", "", true},
-      {"CIM_NumericSensor", "CurrentReading", "40", "45", "", false},
-      {"CIM_NumericSensor", "CurrentReading", "40", "42", "2", true},
-      {"CIM_NumericSensor", "CurrentReading", "40", "43", "2", false},
-      {"CIM_NumericSensor", "CurrentState", "1", "2", "", false},
-      {"ZEP_IPAddress", "ValidLifetime", "100", "40", "", true},
-      {"ZEP_DiskHealth", "BytesWritten", "1", "2", "", true},
-      {"ZEP_DiskHealth", "Temperature", "40", "41", "", true},
-      {"ZEP_DiskHealth", "Temperature", "40", "50", "", false},
-      {"ZEP_DiskHealth", "ReallocatedSectors", "1", "2", "", false},
-      {"ZEP_SmartAttribute", "RawValue", "1", "2", "", true},
-      {"ZEP_SmartAttribute", "WhenFailed", "1", "2", "", false},
-      {"ZEP_KernelLog", "CurrentNumberOfRecords", "1", "2", "", true},
-      {"ZEP_SwapArea", "Used", "1", "2", "", true},
-      {"ZEP_SwapArea", "Size", "1", "2", "", false},
-      {"ZEP_RaidArray", "Progress", "1", "2", "", true},
-      {"ZEP_RaidArray", "FailedMembers", "1", "2", "", false},
-      {"CIM_OperatingSystem", "SizeStoredInPagingFiles", "1", "2", "", false},
-      {"ZEP_MissingValue", "Reason", "1", "2", "", true},
-  };
-  for (auto const& row : rows) {
-    TStoredReport const before = WithProperty(row.fClass, row.fProperty, row.fBefore, row.fHysteresis),
-                        after = WithProperty(row.fClass, row.fProperty, row.fAfter, row.fHysteresis);
-    EXPECT_EQ(DifferencesOf(before, after).IsSame(), row.fIsSame) << row.fProperty << " " << row.fAfter;
-    EXPECT_EQ(DifferencesOf(after, before).IsSame(), row.fIsSame) << row.fProperty << " " << row.fAfter << ", reversed";
-  }
+TEST(DifferencesTest, ValuesThatAlwaysChangeAreNotCompared) {
+  TStoredReport before = Before(), after = Before();
+  before.fInstances[0].fProperties.push_back({"Uptime", "uint64", false, "1", "1", "", "", {}});
+  after.fInstances[0].fProperties.push_back({"Uptime", "uint64", false, "2", "2", "", "", {}});
+  EXPECT_TRUE(DifferencesOf(before, after).IsSame());
 }
 
 TEST(DifferencesTest, RelationsAreNotCompared) {
@@ -204,6 +164,68 @@ TEST(DifferencesTest, ObjectsThatTheSourceDoesNotListAreGone) {
     EXPECT_EQ(differences.fObjects.size(), 2u) << code;
     EXPECT_TRUE(differences.fNotCompared.empty()) << code;
   }
+}
+
+// A class that has objects is described: those that are gone are gone.
+TEST(DifferencesTest, AReasonForSomeObjectsOfAClassHidesNoOther) {
+  TStoredReport after = WithoutModules("too-many", "only the first is described");
+  after.fInstances.push_back(Before().fInstances[0]);
+  TDifferences const differences = DifferencesOf(Before(), after);
+  ASSERT_EQ(differences.fObjects.size(), 1u);
+  EXPECT_EQ(differences.fObjects[0].fName, "DIMM 2");
+}
+
+TStoredReport WithUnreadValues(std::string const& code) {
+  TStoredReport report = Before();
+  report.fFile = "b.json";
+  for (TStoredInstance& instance : report.fInstances)
+    for (TStoredProperty& property : instance.fProperties)
+      if (property.fName == "Voltage" || property.fName == "Removable") property.fMissing = {code, "needs root"};
+  return report;
+}
+
+TEST(DifferencesTest, AValueWhoseSourceCouldNotBeReadHasNotChanged) {
+  ExpectNotCompared(Before(), WithUnreadValues("needs-root"),
+                    "b.json has no CIM_PhysicalMemory.Removable, CIM_PhysicalMemory.Voltage: needs root");
+  EXPECT_EQ(DifferencesOf(Before(), WithUnreadValues("not-given")).fObjects.at(0).fChanges.size(), 2u);
+  TStoredReport row = Before();
+  row.fFile = "b.json";
+  row.fIdentity[0].fAnswer = TAnswer<std::string>::Unknown({"unreadable", "it is closed"}, "");
+  ExpectNotCompared(Before(), row, "b.json has no Host name: it is closed");
+}
+
+// The kernel uses less memory than the modules have.
+TEST(DifferencesTest, RowsOfDifferentSourcesAreNotCompared) {
+  TStoredReport after = Before();
+  after.fFile = "b.json";
+  after.fDetails[0].fAnswer = TAnswer<std::string>::Known("15.5 GiB", "/proc/meminfo");
+  TDifferences const differences = DifferencesOf(Before(), after);
+  EXPECT_TRUE(differences.IsSame());
+  EXPECT_EQ(differences.fNotCompared,
+            (std::vector<std::string>{"Memory is from SMBIOS in a.json, and from /proc/meminfo in b.json"}));
+}
+
+// A report with the record of a disk error, and a problem of it.
+TStoredReport WithRecord(std::string const& time, std::string const& text) {
+  TStoredReport report = Before();
+  std::string const path = "root/x:ZEP_KernelLogRecord.MessageTimestamp=\"" + time + "\",RecordID=\"812\"";
+  TStoredInstance record{path, "Host", "root/x", "ZEP_KernelLogRecord", {}};
+  record.fProperties = {{"RecordID", "string", true, "812", "812", "", "", {}},
+                        {"MessageTimestamp", "datetime", true, time, time, "", "", {}},
+                        {"RecordData", "string", false, text, text, "", "", {}}};
+  report.fInstances.push_back(record);
+  report.fProblems = {{"disk-failing", "error", "the kernel logged an error of sda", "", path}};
+  report.fRules[0].fNotExamined.clear();
+  return report;
+}
+
+TEST(DifferencesTest, AClockThatWasCorrectedMakesNoNewRecordsAndProblems) {
+  TStoredReport const before = WithRecord("20261123040506.000000+000", "I/O error, dev sda");
+  EXPECT_TRUE(DifferencesOf(before, WithRecord("20261123040507.000000+000", "I/O error, dev sda")).IsSame());
+  TDifferences const other = DifferencesOf(before, WithRecord("20261123040507.000000+000", "I/O error, dev sdb"));
+  EXPECT_EQ(other.fObjects.size(), 2u);
+  EXPECT_EQ(other.fNewProblems.size(), 1u);
+  EXPECT_EQ(other.fSolvedProblems.size(), 1u);
 }
 
 // A report without its problem, in which the rule for it has that outcome.
