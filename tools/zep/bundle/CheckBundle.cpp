@@ -16,6 +16,11 @@ namespace {
 constexpr std::uint64_t kMostForeignBytes = std::uint64_t(16) << 20;  // of a member that no bundle has
 constexpr std::size_t kMostMembers = 100;
 
+char const* NameOf(EMemberKind kind) {
+  if (kind == EMemberKind::kLink) return "it is a symbolic link";
+  return kind == EMemberKind::kDirectory ? "it is a directory" : "it is a hard link or a special file";
+}
+
 class TBundleReading {
 public:
   TBundleReading(std::string const& file, TTrust const& trust)
@@ -49,7 +54,7 @@ private:
       Differ(member.fName, "it is contained twice");
       if (isFile) Skip(member.fName);
     } else if (!isFile) {
-      Differ(member.fName, member.fKind == EMemberKind::kLink ? "it is a symbolic link" : "it is a directory");
+      Differ(member.fName, NameOf(member.fKind));
       fExpected.erase(member.fName);
     } else if (member.fName == kSignatureName && fCheck.fManifest.fIsSigned) {
       fSignature = fArchive->Content(kMostManifestBytes);

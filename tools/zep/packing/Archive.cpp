@@ -23,10 +23,10 @@ mode_t TypeOf(EMemberKind kind) {
 EMemberKind KindOf(archive_entry* entry) {
   bool const isHardLink = archive_entry_hardlink(entry) != nullptr;
   mode_t const type = archive_entry_filetype(entry);
-  if (!isHardLink && type == AE_IFREG) return EMemberKind::kFile;
-  if (!isHardLink && type == AE_IFDIR) return EMemberKind::kDirectory;
-  if (!isHardLink && type == AE_IFLNK) return EMemberKind::kLink;
-  throw TArchiveError("it contains something else than files, directories and symbolic links");
+  if (isHardLink) return EMemberKind::kOther;
+  if (type == AE_IFREG) return EMemberKind::kFile;
+  if (type == AE_IFDIR) return EMemberKind::kDirectory;
+  return type == AE_IFLNK ? EMemberKind::kLink : EMemberKind::kOther;
 }
 
 std::string TextOf(char const* text) { return text != nullptr ? text : ""; }

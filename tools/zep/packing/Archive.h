@@ -15,7 +15,7 @@ namespace NQRVZEP20::zep {
 
 // zstd-compressed tar archives of files, directories and symbolic links, by libarchive.
 
-enum class EMemberKind { kFile, kDirectory, kLink };
+enum class EMemberKind { kFile, kDirectory, kLink, kOther };  // other: a hard link, a device, a FIFO; only read, never written
 
 struct TMember {
   EMemberKind fKind;
@@ -47,7 +47,7 @@ class TArchiveReader {
 public:
   virtual ~TArchiveReader() = default;
 
-  // The next member; none at the end. A member of another kind, such as a device or a hard link, is an error.
+  // The next member; none at the end.
   virtual std::optional<TMember> Next() = 0;
 
   // The content of the current member, which is an error if it is longer than `limit` bytes, or has a hole at its end, which

@@ -70,12 +70,18 @@ TCertificates ReadCertificates(TPem const& pem) {
   return certificates;
 }
 
-void CheckCertificate(X509 const* certificate, EVP_PKEY const* key, std::string const& file) {
+// Verification refuses certificates of another purpose, or of another time, so they must not sign.
+void CheckCertificate(X509* certificate, EVP_PKEY const* key, std::string const& file) {
   if (X509_check_private_key(certificate, key) != 1) {
     ERR_clear_error();
     Refuse(file, "has a certificate that belongs to another key than that of --sign");
   }
   if (X509_cmp_current_time(X509_get0_notAfter(certificate)) < 0) Refuse(file, "has a certificate that has expired");
+  if (X509_cmp_current_time(X509_get0_notBefore(certificate)) > 0) Refuse(file, "has a certificate that is not valid yet");
+  if (X509_check_purpose(certificate, X509_PURPOSE_SMIME_SIGN, 0) != 1)
+    Refuse(file,
+           "has a certificate that is not for signatures: its key usage lacks digitalSignature, or its extended key usage lacks "
+           "emailProtection");
 }
 
 // Certificates are trusted as they are, also those that others issued.
@@ -126,7 +132,7 @@ public:
     try {
       SignatureOf("");
     } catch (std::runtime_error const& failure) {
-      Refuse(key.fFile, std::string("has a key that cannot sign: ") + failure.what());
+      Refuse(key.fFile, std::string("has a key that cannot sign; RSA and ECDSA keys can (") + failure.what() + ")");
     }
   }
 
@@ -164,6 +170,7 @@ public:
     TBio const encoded = BioOf(signature), content = BioOf(text);
     TCms const cms(d2i_CMS_bio(encoded.get(), nullptr));
     if (!cms) ThrowRefused();
+    if (BIO_pending(encoded.get()) != 0) throw TSignatureError("it has bytes after its end");
     unsigned flags = CMS_DETACHED | CMS_BINARY;
     if (fSigner) flags |= CMS_NOINTERN;
     if (!fTrusted) flags |= CMS_NO_SIGNER_CERT_VERIFY;

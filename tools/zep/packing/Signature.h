@@ -41,8 +41,8 @@ public:
 };
 
 // The first certificate is that of the key; the others are added to each signature. Throws TFailure with kExitNoInput if a text
-// has no key or no certificate, the key has a passphrase or cannot sign, or the certificate belongs to another key or has
-// expired.
+// has no key or no certificate, the key has a passphrase or cannot sign (only RSA and ECDSA keys can), or the certificate belongs
+// to another key, is not valid now or is not for signatures.
 std::unique_ptr<TSigner> NewSigner(TPem const& key, TPem const& certificates);
 
 // Whose signatures a verifier trusts.

@@ -36,13 +36,21 @@ public:
     X509 const* const above = issuer != nullptr ? issuer->fCertificate.get() : certificate;
     X509_set_issuer_name(certificate, X509_get_subject_name(above));
     if (isAuthority) Extend(NID_basic_constraints, "critical,CA:TRUE");
-    if (X509_sign(certificate, issuer != nullptr ? issuer->fKey.get() : fKey.get(), EVP_sha256()) == 0)
-      throw std::runtime_error("a certificate cannot be signed");
     Write(fKeyFile, [&](std::FILE* file) { PEM_write_PrivateKey(file, fKey.get(), nullptr, nullptr, 0, nullptr, nullptr); });
-    Write(fCertificateFile, [&](std::FILE* file) { PEM_write_X509(file, fCertificate.get()); });
+    Sign(issuer != nullptr ? issuer->fKey.get() : fKey.get());
   }
 
   std::string const fKeyFile, fCertificateFile;
+
+  // Change a certificate that is issued by itself.
+  void RestrictTo(int extension, char const* value) {
+    Extend(extension, value);
+    Sign(fKey.get());
+  }
+  void BeginTomorrow() {
+    X509_gmtime_adj(X509_getm_notBefore(fCertificate.get()), 86400);
+    Sign(fKey.get());
+  }
 
   // Writes the key to another file, with a passphrase.
   void WriteProtectedKey(std::string const& name) const {
@@ -60,6 +68,11 @@ private:
     if (!file) throw std::runtime_error(name + " cannot be written");
     use(file.get());
     std::filesystem::permissions(name, std::filesystem::perms::owner_read | std::filesystem::perms::owner_write);
+  }
+
+  void Sign(EVP_PKEY* key) {
+    if (X509_sign(fCertificate.get(), key, EVP_sha256()) == 0) throw std::runtime_error("a certificate cannot be signed");
+    Write(fCertificateFile, [&](std::FILE* file) { PEM_write_X509(file, fCertificate.get()); });
   }
 
   void Extend(int extension, char const* value) {

@@ -190,6 +190,16 @@ TEST_F(CheckBundleTest, AForeignOrCutFileIsRefused) {
   EXPECT_THAT(WhyRefused(Packed({File("recording.json", "{}")})), StartsWith("it is not a bundle"));
 }
 
+TEST_F(CheckBundleTest, AHardLinkAndAFifoAreNamed) {
+  std::string const repack = "cd '" + fDir.Path() +
+                             "' && tar --zstd -xf bundle && ln -f manifest.json report.json && rm log/zep.log && "
+                             "mkfifo log/zep.log && tar --zstd -cf bundle manifest.json report.json log/zep.log";
+  Write(Good());
+  ASSERT_EQ(std::system(repack.c_str()), 0);
+  EXPECT_THAT(Differences(ReadFile(fDir.Path("bundle"))), ElementsAre("report.json: it is a hard link or a special file",
+                                                                      "log/zep.log: it is a hard link or a special file"));
+}
+
 // The checksum would be that of an empty file; tar would unpack zeros.
 TEST_F(CheckBundleTest, AMemberWithAHoleIsRefused) {
   std::string const repack = "cd '" + fDir.Path() +

@@ -97,6 +97,48 @@ TEST_F(SignatureTest, ACertificateThatHasExpiredNeitherSignsNorIsTrusted) {
   EXPECT_THAT(WhyRefused(signature, {"", fCa.fCertificateFile}), HasSubstr("certificate has expired"));
 }
 
+// Its signature would be refused.
+TEST_F(SignatureTest, ACertificateThatIsNotForSignaturesDoesNotSign) {
+  struct {
+    int fExtension;
+    char const* fValue;
+    bool fSigns;
+  } const rows[] = {{NID_ext_key_usage, "serverAuth", false},
+                    {NID_ext_key_usage, "serverAuth,emailProtection", true},
+                    {NID_key_usage, "keyEncipherment", false},
+                    {NID_key_usage, "digitalSignature", true}};
+  for (auto const& row : rows) {
+    TIdentity restricted(fDir, "restricted");
+    restricted.RestrictTo(row.fExtension, row.fValue);
+    std::string const why = WhyNoSigner(restricted.fKeyFile, restricted.fCertificateFile);
+    EXPECT_EQ(why.empty(), row.fSigns) << row.fValue;
+    if (row.fSigns)
+      EXPECT_EQ(WhyRefused(SignedBy(restricted), {restricted.fCertificateFile, ""}), "");
+    else
+      EXPECT_THAT(why, StartsWith(restricted.fCertificateFile + " has a certificate that is not for signatures: "));
+  }
+}
+
+TEST_F(SignatureTest, ACertificateThatIsNotValidYetDoesNotSign) {
+  TIdentity early(fDir, "early");
+  early.BeginTomorrow();
+  EXPECT_EQ(WhyNoSigner(early.fKeyFile, early.fCertificateFile),
+            early.fCertificateFile + " has a certificate that is not valid yet");
+}
+
+TEST_F(SignatureTest, AKeyOfAnotherKindIsRefusedWithTheKindsThatSign) {
+  std::string const make = "cd '" + fDir.Path() +
+                           "' && openssl req -x509 -newkey ed25519 -nodes -keyout ed.key -out ed.pem -subj /CN=ed -days 10 "
+                           "2> errors";
+  ASSERT_EQ(std::system(make.c_str()), 0) << ReadFile(fDir.Path("errors"));
+  EXPECT_THAT(WhyNoSigner(fDir.Path("ed.key"), fDir.Path("ed.pem")),
+              StartsWith(fDir.Path("ed.key") + " has a key that cannot sign; RSA and ECDSA keys can ("));
+}
+
+TEST_F(SignatureTest, BytesAfterASignatureAreRefused) {
+  EXPECT_EQ(WhyRefused(SignedBy(fAlice) + "junk"), "it has bytes after its end");
+}
+
 TEST_F(SignatureTest, AnythingElseThanASignatureIsRefused) {
   std::string const good = SignedBy(fAlice);
   for (std::string const& bytes :

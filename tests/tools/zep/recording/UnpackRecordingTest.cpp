@@ -169,10 +169,21 @@ TEST_F(UnpackRecordingTest, AForeignOrCutFileIsRefused) {
   EXPECT_THAT(WhyRefused(Packed("no json", {})), StartsWith("recording.json is not sound: "));
 }
 
-TEST_F(UnpackRecordingTest, AnArchiveWithSomethingElseThanFilesIsRefused) {
+TEST_F(UnpackRecordingTest, AFifoIsRefused) {
   ::mkfifo(fDir.Path("recording.json").c_str(), 0600);
   ASSERT_EQ(std::system(("tar -C '" + fDir.Path() + "' -cf '" + fDir.Path("fifo.tar") + "' recording.json").c_str()), 0);
-  EXPECT_EQ(WhyRefused(ReadFile(fDir.Path("fifo.tar"))), "it contains something else than files, directories and symbolic links");
+  EXPECT_EQ(WhyRefused(ReadFile(fDir.Path("fifo.tar"))), "it is not a recording: its first member is not recording.json");
+}
+
+TEST_F(UnpackRecordingTest, AHardLinkIsRefusedByName) {
+  WriteFile(fDir.Path("packed"), Packed(GoodRecording()));
+  std::string const repack = "cd '" + fDir.Path() +
+                             "' && tar --zstd -xf packed && find root -type f | sort | head -n 1 > name && "
+                             "ln -f recording.json \"$(cat name)\" && tar --zstd -cf packed recording.json root";
+  ASSERT_EQ(std::system(repack.c_str()), 0);
+  std::string name = ReadFile(fDir.Path("name"));
+  name.pop_back();
+  EXPECT_EQ(WhyRefused(ReadFile(fDir.Path("packed"))), "its member " + name + " was altered");
 }
 
 // The old tar programs of GNU stored the names in a directory as its content. Skipping one could take hours.
