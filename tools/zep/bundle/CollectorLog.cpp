@@ -31,7 +31,7 @@ std::string WordsOf(TPlugIn const& plugIn) {
 std::string CollectorLog(std::vector<TPlugIn> const& plugIns) {
   std::string log;
   for (ILogger::TLogEntry const& entry : TLogger::GetInstance()->GetLog())
-    if (IsImportant(entry)) log += LineOf(kLabels[entry.fSeverity] + entry.fMessage);
+    if (IsImportant(entry)) log += LineOf(entry.fTimeStamp.ToString() + " " + kLabels[entry.fSeverity] + entry.fMessage);
   for (std::string const& failure : FailuresOf(plugIns)) log += LineOf("plug-in failed: " + failure);
   for (TPlugIn const& plugIn : plugIns) log += WordsOf(plugIn);
   return log;
