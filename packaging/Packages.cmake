@@ -6,13 +6,25 @@ set(ZEP_PACKAGE_CONTACT "the zepcore developers <maintainers@localhost>" CACHE S
 
 set(CPACK_GENERATOR DEB)
 set(CPACK_DEB_COMPONENT_INSTALL ON)
-set(CPACK_STRIP_FILES ON)
+# A build for packages has the types of the library for abidiff and debuggers, without the directory of the build; the preset
+# package-debug has those of everything. They go to packages of their own, NAME-dbgsym.
+set(CPACK_DEBIAN_DEBUGINFO_PACKAGE ${ZEP_PACKAGED})
+if(ZEP_PACKAGED)
+  foreach(target core cim_value cim_model loaders os os_shared ipmi proxy proxy_shared smbios usblan ipmi_client)
+    target_compile_options(${target} PRIVATE -g -ffile-prefix-map=${PROJECT_SOURCE_DIR}=.)
+  endforeach()
+else()
+  set(CPACK_STRIP_FILES ON)
+endif()
 set(CPACK_PACKAGE_CONTACT ${ZEP_PACKAGE_CONTACT})
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
 set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
 set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS_PRIVATE_DIRS ${ZEP_LIB_DIR})
 set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
 set(CPACK_COMPONENTS_ALL)
+
+# The same sources make the same packages: no file is newer than the changelog.
+set(CPACK_PRE_BUILD_SCRIPTS ${CMAKE_CURRENT_SOURCE_DIR}/SetTimes.cmake)
 
 find_program(ZEP_GZIP gzip REQUIRED)
 configure_file(changelog.in ${CMAKE_CURRENT_BINARY_DIR}/changelog @ONLY)
