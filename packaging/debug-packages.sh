@@ -1,14 +1,16 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
 #
-# Makes packages NAME-dbgsym_*.deb, as Debian has them, of those that CPack made as NAME-dbgsym_*.ddeb: with checksums of the paths
-# in the package, plain files, and the documents of the package NAME.
+# Makes packages debug/NAME-dbgsym_*.deb, as Debian has them, of those that CPack made as NAME-dbgsym_*.ddeb: with checksums of the
+# paths in the package, plain files, and the documents of the package NAME.
 #
 #   debug-packages.sh DIRECTORY
 set -euo pipefail
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
+rm -rf "$1/debug"
+mkdir "$1/debug"
 for file in "$1"/*.ddeb; do
   tree=$work/$(basename "$file" .ddeb)
   name=$(dpkg-deb --field "$file" Package)
@@ -17,6 +19,6 @@ for file in "$1"/*.ddeb; do
   ln -s "${name%-dbgsym}" "$tree/usr/share/doc/$name"
   find "$tree" -type f -exec chmod 644 {} +
   (cd "$tree" && find usr -type f -print0 | sort -z | xargs -0 md5sum >DEBIAN/md5sums)
-  dpkg-deb --root-owner-group --build "$tree" "${file%.ddeb}.deb" >/dev/null
+  dpkg-deb --root-owner-group --build "$tree" "$1/debug/$(basename "$file" .ddeb).deb" >/dev/null
   rm "$file"
 done

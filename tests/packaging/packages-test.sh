@@ -35,13 +35,22 @@ grep -q '^License: GPL-3.0-or-later$' "$work/log" || fail "libzepcore-ipmi does 
 
 # The address of the maintainer is that of the person who makes the packages (ZEP_PACKAGE_CONTACT).
 if command -v lintian >/dev/null; then
-  lintian --allow-root --suppress-tags bogus-mail-host,bogus-mail-host-in-debian-changelog "$packages"/*.deb >"$work/log" 2>&1 ||
+  lintian --allow-root --suppress-tags bogus-mail-host,bogus-mail-host-in-debian-changelog "$packages"/*.deb "$packages"/debug/*.deb >"$work/log" 2>&1 ||
     fail "lintian fails:" "$work/log"
   [[ ! -s $work/log ]] || fail "lintian reports:" "$work/log"
 else
   [[ ${CI:-} != true ]] || fail "lintian is not installed"
   echo "lintian is not installed: the packages are not checked"
 fi
+
+# The debug information is found by the build identification of a library, and no package names the directory of the build.
+for file in "$packages"/*.deb "$packages"/debug/*.deb; do dpkg-deb --extract "$file" "$work/all"; done
+id=$(readelf --notes "$work"/all/usr/lib/*/zepcore/libzepcore.so.1 | sed -n 's/.*Build ID: //p')
+debug=$work/all/usr/lib/debug/.build-id/${id:0:2}/${id:2}.debug
+readelf --debug-dump=info --dwarf-depth=1 "$debug" 2>/dev/null | grep 'DW_AT_name.*cim/value/TCIMValue.cpp' >/dev/null ||
+  fail "libzepcore1-dbgsym has no debug information of libzepcore.so.1"
+! grep -rlF "$(dirname "$(dirname "$packages")")" "$work/all" >"$work/log" || fail "files name the directory of the build:" "$work/log"
+rm -r "$work/all"
 
 # Unpacks the package and those of ours that it depends on.
 unpack() {  # unpack NAME
