@@ -88,6 +88,15 @@ for command in "" report "plugin new"; do
     fail "the manual page of zep $command differs from its help:" "$work/log"
 done
 
+# The pages about the settings and the library are the sections of the documents.
+page_of() { gzip -dc "$work/root/usr/share/man/$1.gz" | man --warnings -E UTF-8 -l -Tutf8 -P cat - 2>&1 | col -bx; }
+page_of man5/zep.cfg.5 >"$work/log"
+grep -q 'finding-disk-used-percent' "$work/log" || fail "zep.cfg(5) has no thresholds:" "$work/log"
+! grep 'warning' "$work/log" || fail "zep.cfg(5) is not well formed"
+page_of man7/libzepcore.7 >"$work/log"
+grep -q 'kZEPStatusNotFound' "$work/log" || fail "libzepcore(7) does not describe the errors:" "$work/log"
+! grep 'warning' "$work/log" || fail "libzepcore(7) is not well formed"
+
 for file in bash-completion/completions/zep fish/vendor_completions.d/zep.fish zsh/vendor-completions/_zep; do
   grep -q 'Completion of zep' "$work/root/usr/share/$file" || fail "$file does not complete the command line of zep"
 done
