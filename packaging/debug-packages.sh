@@ -19,6 +19,6 @@ for file in "$1"/*.ddeb; do
   ln -s "${name%-dbgsym}" "$tree/usr/share/doc/$name"
   find "$tree" -type f -exec chmod 644 {} +
   (cd "$tree" && find usr -type f -print0 | sort -z | xargs -0 md5sum >DEBIAN/md5sums)
-  dpkg-deb --root-owner-group --build "$tree" "$1/debug/$(basename "$file" .ddeb).deb" >/dev/null
+  dpkg-deb --root-owner-group -Zgzip -z6 --build "$tree" "$1/debug/$(basename "$file" .ddeb).deb" >/dev/null
   rm "$file"
 done

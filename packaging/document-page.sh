@@ -33,4 +33,4 @@ section_of() {  # section_of DOCUMENT HEADING
   printf '\n# SEE ALSO\n\n%s\n' "$see_also"
 } | lowdown -s -Tman --out-no-smarty --nroff-nolinks -M title="$name" -M section="$section" -M source="zepcore $version" |
   sed "s/\\\\fC/\\\\fB/g; 1i'\\\\\" t
-    /^\.TH /a.ad l"  # code is bold; tables need the preprocessor tbl, and narrow columns no even margin
+    /^\.TH /a.ad l\n.nh"  # code is bold; tables need the preprocessor tbl; names of settings are not hyphenated
