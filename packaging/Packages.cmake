@@ -10,7 +10,7 @@ set(CPACK_DEB_COMPONENT_INSTALL ON)
 # package-debug has those of everything. They go to packages of their own, NAME-dbgsym.
 set(CPACK_DEBIAN_DEBUGINFO_PACKAGE ${ZEP_PACKAGED})
 if(ZEP_PACKAGED)
-  foreach(target core cim_value cim_model loaders os os_shared ipmi proxy proxy_shared smbios usblan ipmi_client)
+  foreach(target core cim_value cim_model loaders os os_shared ipmi proxy proxy_shared smbios usblan ipmi_client packing zep_packing)
     target_compile_options(${target} PRIVATE -g -ffile-prefix-map=${PROJECT_SOURCE_DIR}=.)
   endforeach()
 else()
