@@ -50,6 +50,8 @@ debug=$work/all/usr/lib/debug/.build-id/${id:0:2}/${id:2}.debug
 readelf --debug-dump=info --dwarf-depth=1 "$debug" 2>/dev/null | grep 'DW_AT_name.*cim/value/TCIMValue.cpp' >/dev/null ||
   fail "libzepcore1-dbgsym has no debug information of libzepcore.so.1"
 ! grep -rlF "$(dirname "$(dirname "$packages")")" "$work/all" >"$work/log" || fail "files name the directory of the build:" "$work/log"
+date=$(gzip -dc "$work/all/usr/share/doc/zep/changelog.gz" | sed -n 's/^ -- .*>  //p')
+[[ $(stat --format=%Y "$work/all/usr/bin/zep") == $(date --date="$date" +%s) ]] || fail "the time of the files is not that of the changelog"
 rm -r "$work/all"
 
 # Unpacks the package and those of ours that it depends on.
