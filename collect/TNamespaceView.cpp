@@ -48,10 +48,12 @@ std::string TNamespaceView::GetName() const { return fNamespace->GetName(TCIMCon
 
 boost::shared_ptr<ICIMClass> TNamespaceView::FindClass(std::string const& name) const {
   if (auto const* const received = dynamic_cast<TReceivedNamespace const*>(fNamespace.get())) return received->FindClass(name);
+  if (fUnknownClasses.count(name) > 0) return {};
   try {
     return fNamespace->GetClass(name, TCIMContext());
   } catch (TZEPException const& failure) {
     if (failure.GetStatusCode() != kZEPStatusNotFound) throw;
+    fUnknownClasses.insert(name);
     return {};
   }
 }

@@ -101,6 +101,14 @@ TEST_F(TNamespaceViewTest, APathIsUtf8) {
   EXPECT_EQ(View().PathOf(*fNamespace->AddInstance("X_Bytes", {{"Id", "\xff"}})), "root/test:X_Bytes.Id=\"\\xff\"");
 }
 
+TEST_F(TNamespaceViewTest, AClassThatIsMissingIsNotLookedForAgain) {
+  TNamespaceView const view = View();
+  EXPECT_FALSE(view.FindClass("X_Late"));
+  fNamespace->DefineClass("X_Late");
+  EXPECT_FALSE(view.FindClass("X_Late"));
+  EXPECT_TRUE(View().FindClass("X_Late"));
+}
+
 TEST_F(TNamespaceViewTest, AClassThatIsMissingHasNoInstances) {
   EXPECT_FALSE(View().FindClass("X_None"));
   EXPECT_TRUE(View().InstancesOf("X_None").empty());
