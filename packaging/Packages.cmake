@@ -34,17 +34,18 @@ execute_process(COMMAND ${ZEP_GZIP} -9 -n -c ${CMAKE_CURRENT_BINARY_DIR}/changel
 
 # A package with the files of one component of the installation:
 #
-#   zep_package(COMPONENT NAME SYNOPSIS TEXT SECTION COPYRIGHT [DEPENDS package,...] [RECOMMENDS ...] [SUGGESTS ...])
+#   zep_package(COMPONENT NAME SYNOPSIS TEXT SECTION COPYRIGHT [DEPENDS package,...] [RECOMMENDS ...] [SUGGESTS ...] [PROVIDES ...]
+#     [CONFLICTS ...])
 #
 # A line of TEXT has at most 79 characters.
 macro(zep_package component name synopsis text section copyright)
-  cmake_parse_arguments(ARG "" "DEPENDS;RECOMMENDS;SUGGESTS" "" ${ARGN})
+  cmake_parse_arguments(ARG "" "DEPENDS;RECOMMENDS;SUGGESTS;PROVIDES;CONFLICTS" "" ${ARGN})
   string(TOUPPER ${component} upper)
   list(APPEND CPACK_COMPONENTS_ALL ${component})
   set(CPACK_DEBIAN_${upper}_PACKAGE_NAME ${name})
   set(CPACK_DEBIAN_${upper}_PACKAGE_SECTION ${section})
   set(CPACK_COMPONENT_${upper}_DESCRIPTION "${synopsis}\n${text}")
-  foreach(relation DEPENDS RECOMMENDS SUGGESTS)
+  foreach(relation DEPENDS RECOMMENDS SUGGESTS PROVIDES CONFLICTS)
     set(CPACK_DEBIAN_${upper}_PACKAGE_${relation} ${ARG_${relation}})
   endforeach()
   install(FILES ${CMAKE_CURRENT_BINARY_DIR}/changelog.gz DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/${name} COMPONENT ${component})
@@ -59,7 +60,8 @@ zep_package(library ${library} "core library of a server diagnostic data collect
 "Identity, hardware and health of a server as CIM objects, which provider
 plug-ins collect. This package has the library, which plug-ins and front ends
 link, and its library for SMBIOS tables."
-  libs copyright RECOMMENDS libcurl4)  # loaded at run time, for transfers only
+  libs copyright RECOMMENDS libcurl4  # loaded at run time, for transfers only
+  PROVIDES libzepcore-abi CONFLICTS libzepcore-abi)  # one SONAME at a time: their plug-ins are in one directory
 
 # A provider: zep_provider_package(NAME TITLE WHAT [SUGGESTS ...] [RECOMMENDS ...])
 macro(zep_provider_package name title what)
@@ -94,7 +96,7 @@ schema of the DMTF, if it was built with it."
 
 install(DIRECTORY ${PROJECT_SOURCE_DIR}/docs/ DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/libzepcore-doc/docs COMPONENT documentation
   FILES_MATCHING PATTERN "*.md" PATTERN "schema" EXCLUDE)
-install(FILES ${PROJECT_SOURCE_DIR}/README.md DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/libzepcore-doc COMPONENT documentation)
+install(FILES ${PROJECT_SOURCE_DIR}/README.md ${PROJECT_SOURCE_DIR}/CHANGELOG.md ${PROJECT_SOURCE_DIR}/CONTRIBUTING.md DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/libzepcore-doc COMPONENT documentation)
 install(DIRECTORY ${PROJECT_SOURCE_DIR}/examples DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/libzepcore-doc COMPONENT documentation)
 set(CPACK_DEBIAN_DOCUMENTATION_PACKAGE_ARCHITECTURE all)
 zep_package(documentation libzepcore-doc "documents and examples of zepcore"

@@ -48,7 +48,9 @@ check "the consumer built with pkg-config" "$work/consumer"
 for compiler in "$cxx" clang++; do
   command -v "$compiler" >/dev/null || { echo "$compiler is not installed: it builds no plug-in"; continue; }
   read -ra flags <<<"$(pkg-config --cflags --libs zepcore-memory)"
-  "$compiler" -std=c++17 -fPIC -shared -fvisibility=hidden "$here/../../examples/Clock/Clock.cpp" -o "$work/libPlain.nsp.so" "${flags[@]}"
+  "$compiler" -std=c++17 -fPIC -shared -fvisibility=hidden "$here/../../examples/Clock/Clock.cpp" -o "$work/libPlain.nsp.so" "${flags[@]}" \
+    -Wl,--version-script="$(pkg-config --variable=pluginmap zepcore-memory)"
+  [[ -z $(nm --dynamic --defined-only "$work/libPlain.nsp.so") ]] || { echo "the plug-in built with $compiler exports symbols" >&2; exit 1; }
   "$work/prefix/bin/zep" classes --plugin "$work/libPlain.nsp.so" >"$work/report" 2>&1 || true  # other plug-ins may fail
   grep -q '^X_Clock ' "$work/report" || { echo "the plug-in built with $compiler and pkg-config is not loaded:" >&2; cat "$work/report" >&2; exit 1; }
 done
