@@ -33,7 +33,7 @@ struct TCause {
 struct TProviderRun {
   std::string fName;
   std::shared_ptr<TNamespaceView const> fView;  // null when the provider failed before it had filled its namespace
-  double fMilliseconds;                         // the time to fill the namespace
+  double fMilliseconds = 0;                     // the time to fill the namespace
   std::string fError;                           // why the provider failed; empty when it succeeded
   std::string fStage = {};                      // the stage that failed: "registration" or "fill"; otherwise empty
   std::string fLastLogLine = {};                // the last before the failure: "[Error] no disk"; empty if unknown
@@ -50,10 +50,10 @@ struct TTraces {
 
 // One provider plug-in: a library lib*.nsp.so in the directory of libzepcore.so, or one that is tried from elsewhere.
 struct TPlugIn {
-  std::string fName;     // "Host" for libHost.nsp.so
-  std::string fFile;     // its path
-  double fMilliseconds;  // the time to load the library
-  std::string fError;    // why the library could not be loaded; empty when it was
+  std::string fName;         // "Host" for libHost.nsp.so
+  std::string fFile;         // its path
+  double fMilliseconds = 0;  // the time to load the library; 0 if it was not
+  std::string fError;        // why the library could not be loaded; empty when it was
   std::vector<TProviderRun> fProviders;
   std::string fStage = {};              // the stage that failed: "open", "static construction" or "registration"; otherwise empty
   std::string fLastLogLine = {};        // the last before the failure; empty if unknown

@@ -7,6 +7,8 @@
 
 #include <gmock/gmock.h>
 
+#include <new>
+
 namespace NQRVZEP20 {
 namespace {
 
@@ -150,6 +152,15 @@ TEST_F(TPlugInAnswerTest, AnAnswerOfAnyMessagesHasAResult) {
     EXPECT_EQ(answer->State(), row.fState);
     EXPECT_EQ(AsText(answer->Finish("")), row.fResult);
   }
+}
+
+// The memory is filled before, so that a member without a value is noticed.
+TEST_F(TPlugInAnswerTest, APlugInThatWasNotLoadedTookNoTime) {
+  alignas(TPlugInAnswer) unsigned char memory[sizeof(TPlugInAnswer)];
+  for (unsigned char volatile& byte : memory) byte = 0xd2;
+  auto* const answer = new (memory) TPlugInAnswer("Test", "/lib/libTest.nsp.so", fLimits, "", [] { return ""; });
+  EXPECT_EQ(answer->Finish("").fMilliseconds, 0);
+  answer->~TPlugInAnswer();
 }
 
 TEST_F(TPlugInAnswerTest, AnAnswerIsTheSameInPiecesOfAnySize) {
